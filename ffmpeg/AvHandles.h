@@ -1,0 +1,108 @@
+// Owners for the objects of FFmpeg's libraries, and the text of their errors. Nothing else is wrapped.
+#ifndef MOVIECONV_FFMPEG_AVHANDLES_H
+#define MOVIECONV_FFMPEG_AVHANDLES_H
+
+extern "C" {
+#include <libavcodec/avcodec.h>
+#include <libavformat/avformat.h>
+#include <libavutil/audio_fifo.h>
+#include <libavutil/error.h>
+#include <libavutil/mem.h>
+#include <libswresample/swresample.h>
+#include <libswscale/swscale.h>
+}
+
+#include <array>
+#include <memory>
+#include <string>
+
+namespace av {
+
+struct FrameFree {
+    void operator()(AVFrame* frame) const { av_frame_free(&frame); }
+};
+struct PacketFree {
+    void operator()(AVPacket* packet) const { av_packet_free(&packet); }
+};
+struct CodecContextFree {
+    void operator()(AVCodecContext* context) const { avcodec_free_context(&context); }
+};
+struct InputFree {
+    void operator()(AVFormatContext* context) const { avformat_close_input(&context); }
+};
+struct OutputFree {
+    void operator()(AVFormatContext* context) const { avformat_free_context(context); }
+};
+struct IoFree {
+    void operator()(AVIOContext* io) const {
+        av_freep(static_cast<void*>(&io->buffer));
+        avio_context_free(&io);
+    }
+};
+struct ScalerFree {
+    void operator()(SwsContext* scaler) const { sws_freeContext(scaler); }
+};
+struct ResamplerFree {
+    void operator()(SwrContext* resampler) const { swr_free(&resampler); }
+};
+struct SampleFifoFree {
+    void operator()(AVAudioFifo* fifo) const { av_audio_fifo_free(fifo); }
+};
+
+using Frame = std::unique_ptr<AVFrame, FrameFree>;
+using Packet = std::unique_ptr<AVPacket, PacketFree>;
+using CodecContext = std::unique_ptr<AVCodecContext, CodecContextFree>;
+/// An AVFormatContext opened with avformat_open_input.
+using Input = std::unique_ptr<AVFormatContext, InputFree>;
+/// An AVFormatContext allocated for writing; its AVIOContext is owned apart.
+using Output = std::unique_ptr<AVFormatContext, OutputFree>;
+/// An AVIOContext made with avio_alloc_context; what lies behind its `opaque` is owned apart.
+using Io = std::unique_ptr<AVIOContext, IoFree>;
+using Scaler = std::unique_ptr<SwsContext, ScalerFree>;
+using Resampler = std::unique_ptr<SwrContext, ResamplerFree>;
+using SampleFifo = std::unique_ptr<AVAudioFifo, SampleFifoFree>;
+
+/// Options for an open call; what is left in it afterwards was not recognised.
+class Options {
+public:
+    Options() = default;
+    Options(const Options&) = delete;
+    Options& operator=(const Options&) = delete;
+    ~Options() { av_dict_free(&entries_); }
+
+    void Set(const char* key, const char* value) { av_dict_set(&entries_, key, value, 0); }
+    void Set(const char* key, int64_t value) { av_dict_set_int(&entries_, key, value, 0); }
+    AVDictionary** Get() { return &entries_; }
+
+private:
+    AVDictionary* entries_ = nullptr;
+};
+
+/// A channel layout that releases what it owns.
+class ChannelLayout {
+public:
+    ChannelLayout() = default;
+    /// The usual layout for that many channels.
+    explicit ChannelLayout(int channels) { av_channel_layout_default(&layout_, channels); }
+    ChannelLayout(const ChannelLayout&) = delete;
+    ChannelLayout& operator=(const ChannelLayout&) = delete;
+    ~ChannelLayout() { av_channel_layout_uninit(&layout_); }
+
+    AVChannelLayout* Get() { return &layout_; }
+    const AVChannelLayout* Get() const { return &layout_; }
+    int Channels() const { return layout_.nb_channels; }
+
+private:
+    AVChannelLayout layout_{};
+};
+
+/// What an error code of the libraries means, in English.
+inline std::string ErrorText(int code) {
+    std::array<char, AV_ERROR_MAX_STRING_SIZE> text{};
+    av_strerror(code, text.data(), text.size());
+    return text.data();
+}
+
+} // namespace av
+
+#endif

@@ -1,0 +1,140 @@
+// The media writer's second header: what the five functions of media/MediaWriter.h have no room for. A host
+// sets options here before a conversion, and learns here how each file stands and what went wrong. The engine
+// needs none of it.
+//
+// All functions may be called on any thread. Texts are UTF-8; bytes of a file name that are not UTF-8 stand
+// as they are.
+#ifndef MOVIECONV_WRITER_WRITERSTATUS_H
+#define MOVIECONV_WRITER_WRITERSTATUS_H
+
+#include <stdint.h>
+
+#ifdef __cplusplus
+extern "C" {
+#endif
+#pragma GCC visibility push(default)
+
+/// Where a file is in its life.
+enum {
+    kWriterFileWriting = 1, ///< Pictures and sound are being taken.
+    kWriterFileFinishing =
+        2, ///< Closed by the engine; the rest is being encoded, the index written, the file synced.
+    kWriterFileComplete = 3, ///< Complete, on the disk, under its real name.
+    kWriterFileFailed = 4    ///< Not complete and never will be; see nError. The real name was not touched.
+};
+
+/// What went wrong.
+enum {
+    kWriterErrorNone = 0,
+    kWriterErrorArgument = 1, ///< The parameters make no sense: no name, no stream, a negative size.
+    kWriterErrorFormat = 2,   ///< The file format is not in the table.
+    kWriterErrorCodec = 3,   ///< The format cannot carry the codec, or this build of FFmpeg cannot encode it.
+    kWriterErrorExists = 4,  ///< The target exists and WriterOptions forbids replacing it.
+    kWriterErrorOpen = 5,    ///< The temporary file could not be created; see nSystemError.
+    kWriterErrorNoSpace = 6, ///< The disk or the quota is full.
+    kWriterErrorWrite = 7,   ///< Another write failure; see nSystemError.
+    kWriterErrorEncode = 8,  ///< An encoder or the multiplexer refused its input.
+    kWriterErrorFinish = 9,  ///< Everything was written, but syncing or renaming failed; see nSystemError.
+    kWriterErrorInternal = 10 ///< Out of memory, or a fault of the writer.
+};
+
+enum { kWriterTextSize = 512, kWriterPathSize = 4096 };
+
+/// One output file, as it stands. Lengths are in seconds, sizes in bytes, samples in sample frames (one per
+/// channel).
+typedef struct WriterStatus {
+    int32_t nSequence;    ///< Number of the file in this process, from 1, in the order of creation.
+    int32_t nState;       ///< kWriterFile...
+    int32_t nError;       ///< kWriterError...; the first one of this file stays.
+    int32_t nSystemError; ///< errno of the failed call, 0 when the fault is not the system's.
+
+    int64_t
+        llBytesWritten; ///< Size of the file so far (temporary or final), as far as it has left the writer.
+    int64_t llPicturesReceived; ///< Pictures taken by MWWriteVideoFrame.
+    int64_t llPicturesWritten;  ///< Pictures in the file, repeated ones counted.
+    int64_t llPicturesDropped;  ///< Pictures left out because a lower frame rate was asked for.
+    int64_t llPicturesRepeated; ///< Pictures shown again because a higher frame rate was asked for.
+    int64_t llSamplesReceived;  ///< Sample frames taken by MWWriteAudioData, at the source's rate.
+    int64_t llSamplesWritten;   ///< Sample frames in the file, at the output's rate; the codec's padding not
+                                ///< counted.
+    int64_t llStampsRepaired;   ///< Pictures whose stamp did not fit the sound's timeline and was put right.
+
+    double dVideoReceived; ///< Length of the pictures taken, first to end of last, on the file's timeline.
+    double dAudioReceived; ///< Length of the sound taken.
+    double dVideoWritten;  ///< Length of the picture stream in the file; 0 without one.
+    double dAudioWritten;  ///< Length of the sound stream in the file, without the codec's padding; 0 without
+                           ///< one.
+    double dFinished;      ///< While finishing, how much of it is done: 0 to 1.
+
+    int32_t nSampleRate;   ///< Sample rate in the file: the nearest that the codec takes. 0 without sound.
+    int32_t nAudioBitrate; ///< Sound bit rate in use, after the codec's limits; 0 for codecs without one.
+    int32_t nWidth;        ///< Picture size in the file; 0 without pictures.
+    int32_t nHeight;
+
+    char szWhat[kWriterTextSize];          ///< What went wrong, a sentence for users; empty when nothing did.
+    char szPath[kWriterPathSize];          ///< The target as the engine named it.
+    char szTemporaryPath[kWriterPathSize]; ///< Where the data is until then; empty once complete or when
+                                           ///< removed.
+} WriterStatus;
+
+/// What a listener is told.
+enum {
+    kWriterEventOpened = 1,  ///< A file was created and takes pictures and sound.
+    kWriterEventRefused = 2, ///< A file could not be created: MWCreateMediaFile is about to return null.
+    kWriterEventFailed = 3,  ///< Writing failed; nothing more is taken. Comes once, long before the close.
+    kWriterEventFinishing =
+        4, ///< The close goes on; comes at its start and whenever dFinished has grown visibly.
+    kWriterEventClosed = 5 ///< The file is complete, or the failed one is closed.
+};
+
+/// Told of what happens to files. Called on the engine's worker for all but kWriterEventFailed, which comes
+/// on a thread of the writer's. It must return soon and must not call back into the converter except for
+/// MCAbort.
+typedef void (*WriterListener)(void* context, int event, const WriterStatus* status);
+
+/// Asked when the disk is full. May block, for instance until there is room or the user gives up. Nonzero:
+/// the same write is tried again; 0: the file fails. Called on a thread of the writer's, or on the engine's
+/// worker inside MWCloseMediaFile; the engine's worker waits meanwhile as soon as the writer's queues are
+/// full.
+typedef int (*WriterFullDiskHandler)(void* context, const WriterStatus* status);
+
+/// Options for the files created from now on; all zero is the default.
+typedef struct WriterOptions {
+    int32_t nSampleAspectNum; ///< Shape of the source's pixels, width to height; 0 or 0:0 counts as 1:1.
+    int32_t nSampleAspectDen;
+    int32_t bFullRange;      ///< Nonzero: luma covers 0 to 255, not 16 to 235.
+    int32_t nColorPrimaries; ///< As in ISO/IEC 23091-2; 0 or 2: not stated.
+    int32_t nColorTransfer;  ///< As in ISO/IEC 23091-2; 0 or 2: not stated.
+    int32_t nColorMatrix;    ///< As in ISO/IEC 23091-2; 0 or 2: not stated.
+    int32_t
+        nEncoderThreads;    ///< Threads of the picture encoder; 0: one, whose output never depends on timing.
+    int32_t bBitExact;      ///< Nonzero: nothing in the file tells time, date or library version.
+    int32_t bKeepExisting;  ///< Nonzero: a target that exists is never replaced; creating it fails.
+    int32_t bRemovePartial; ///< Nonzero: a failed file's temporary file is removed; by default it stays,
+                            ///< playable.
+    WriterListener pfnListener;        ///< May be null.
+    WriterFullDiskHandler pfnFullDisk; ///< Null: a full disk fails the file at once.
+    void* pContext;                    ///< First argument of both.
+} WriterOptions;
+
+/// Sets the options for files created from now on, in the whole process; files that are open keep theirs.
+/// Null restores the defaults. A listener is not called any more once the files created with it are closed.
+void MWSetWriterOptions(const WriterOptions* options);
+
+/// Files created so far in this process, refused ones counted: the highest sequence number.
+int MWGetFileCount(void);
+
+/// Copies how file `sequence` stands. Open files and the last 64 others are remembered. Returns 1; 0 when the
+/// file is not known (any more) or `status` is null.
+int MWGetFileStatus(int sequence, WriterStatus* status);
+
+/// Copies the latest status that carries an error. Returns 1; 0 when no file has failed yet or `status` is
+/// null.
+int MWGetLastFailure(WriterStatus* status);
+
+#pragma GCC visibility pop
+#ifdef __cplusplus
+}
+#endif
+
+#endif
