@@ -1,0 +1,193 @@
+#include "platform/Platform.h"
+
+#include <algorithm>
+#include <array>
+#include <atomic>
+#include <chrono>
+#include <condition_variable>
+#include <cstddef>
+#include <deque>
+#include <exception>
+#include <mutex>
+#include <new>
+#include <utility>
+#include <vector>
+
+namespace {
+
+struct Parameter {
+    EventParamName name;
+    EventParamType type;
+    std::vector<std::byte> data;
+};
+
+} // namespace
+
+struct OpaqueEventRef {
+    OpaqueEventRef(OSType theClass, UInt32 theKind) : eventClass(theClass), eventKind(theKind) {}
+
+    auto Find(EventParamName name) {
+        return std::find_if(parameters.begin(), parameters.end(),
+                            [name](const Parameter& p) { return p.name == name; });
+    }
+
+    const OSType eventClass;
+    const UInt32 eventKind;
+    std::atomic<long> references{1};
+    std::vector<Parameter> parameters;
+    bool queued = false; // guarded by the queue's mutex
+};
+
+namespace {
+
+bool Matches(const OpaqueEventRef& event, ItemCount numTypes, const EventTypeSpec* list) {
+    return numTypes == 0 || std::any_of(list, list + numTypes, [&event](const EventTypeSpec& type) {
+               return type.eventClass == event.eventClass && type.eventKind == event.eventKind;
+           });
+}
+
+} // namespace
+
+struct OpaqueEventQueueRef {
+    OSStatus Post(EventRef event, EventPriority priority) {
+        {
+            const std::lock_guard lock(mutex);
+            if (event->queued)
+                return eventAlreadyPostedErr;
+            if (size == kCapacity)
+                return eventQueueFullErr;
+            events[static_cast<std::size_t>(priority)].push_back(event);
+            event->queued = true;
+            ++size;
+            RetainEvent(event);
+        }
+        arrived.notify_all(); // receivers may wait for different types
+        return noErr;
+    }
+
+    EventRef Receive(ItemCount numTypes, const EventTypeSpec* list, EventTimeout timeout, bool pull) {
+        EventRef event = nullptr;
+        const auto taken = [&] { return (event = Take(numTypes, list, pull)) != nullptr; };
+        std::unique_lock lock(mutex);
+        if (timeout < 0 || timeout > kLongestTimeout)
+            arrived.wait(lock, taken);
+        else
+            arrived.wait_for(lock, std::chrono::duration<double>(timeout), taken);
+        return event;
+    }
+
+private:
+    static constexpr std::size_t kCapacity = 16384; // a host that never receives must not fill the memory
+    static constexpr EventTimeout kLongestTimeout = 1e8; // seconds; what is longer may overflow the clock
+
+    EventRef Take(ItemCount numTypes, const EventTypeSpec* list, bool pull) {
+        for (auto queue = events.rbegin(); queue != events.rend(); ++queue) {
+            const auto found = std::find_if(queue->begin(), queue->end(),
+                                            [=](EventRef event) { return Matches(*event, numTypes, list); });
+            if (found == queue->end())
+                continue;
+            const EventRef event = *found;
+            if (pull) {
+                queue->erase(found);
+                event->queued = false;
+                --size;
+            }
+            return event;
+        }
+        return nullptr;
+    }
+
+    std::mutex mutex;
+    std::condition_variable arrived;
+    std::array<std::deque<EventRef>, kEventPriorityHigh + 1> events; // by priority
+    std::size_t size = 0;
+};
+
+OSStatus CreateEvent(CFAllocatorRef /*allocator*/, OSType eventClass, UInt32 eventKind, EventTime /*when*/,
+                     EventAttributes /*attributes*/, EventRef* outEvent) {
+    if (!outEvent)
+        return paramErr;
+    *outEvent = new (std::nothrow) OpaqueEventRef(eventClass, eventKind);
+    return *outEvent ? noErr : memFullErr;
+}
+
+EventRef RetainEvent(EventRef event) {
+    if (event)
+        event->references.fetch_add(1, std::memory_order_relaxed);
+    return event;
+}
+
+void ReleaseEvent(EventRef event) {
+    if (event && event->references.fetch_sub(1, std::memory_order_acq_rel) == 1)
+        delete event;
+}
+
+OSType GetEventClass(EventRef event) {
+    return event ? event->eventClass : 0;
+}
+
+UInt32 GetEventKind(EventRef event) {
+    return event ? event->eventKind : 0;
+}
+
+OSStatus SetEventParameter(EventRef event, EventParamName name, EventParamType type, ByteCount size,
+                           const void* data) {
+    if (!event || (!data && size > 0))
+        return paramErr;
+    try {
+        const auto* bytes = static_cast<const std::byte*>(data);
+        Parameter parameter{name, type, std::vector<std::byte>(bytes, bytes + size)};
+        const auto found = event->Find(name);
+        if (found != event->parameters.end())
+            *found = std::move(parameter);
+        else
+            event->parameters.push_back(std::move(parameter));
+        return noErr;
+    } catch (const std::exception&) { // no memory, or no vector of that size
+        return memFullErr;
+    }
+}
+
+OSStatus GetEventParameter(EventRef event, EventParamName name, EventParamType desiredType,
+                           EventParamType* outActualType, ByteCount bufferSize, ByteCount* outActualSize,
+                           void* outData) {
+    if (!event)
+        return paramErr;
+    const auto found = event->Find(name);
+    if (found == event->parameters.end())
+        return eventParameterNotFoundErr;
+    if (desiredType != typeWildCard && desiredType != found->type)
+        return errAECoercionFail;
+    if (outActualType)
+        *outActualType = found->type;
+    if (outActualSize)
+        *outActualSize = found->data.size();
+    if (outData)
+        std::copy_n(found->data.begin(), std::min<std::size_t>(bufferSize, found->data.size()),
+                    static_cast<std::byte*>(outData));
+    return noErr;
+}
+
+EventQueueRef GetMainEventQueue() {
+    // Never freed: workers may post while the process ends.
+    static auto* const queue = new OpaqueEventQueueRef;
+    return queue;
+}
+
+OSStatus PostEventToQueue(EventQueueRef queue, EventRef event, EventPriority priority) {
+    if (!queue || !event || priority < kEventPriorityLow || priority > kEventPriorityHigh)
+        return paramErr;
+    try {
+        return queue->Post(event, priority);
+    } catch (const std::bad_alloc&) {
+        return memFullErr;
+    }
+}
+
+OSStatus ReceiveNextEvent(ItemCount numTypes, const EventTypeSpec* list, EventTimeout timeout,
+                          Boolean pullEvent, EventRef* outEvent) {
+    if (!outEvent || (numTypes > 0 && !list))
+        return paramErr;
+    *outEvent = GetMainEventQueue()->Receive(numTypes, list, timeout, pullEvent != 0);
+    return *outEvent ? noErr : eventLoopTimedOutErr;
+}
