@@ -1,0 +1,90 @@
+// A queue between two threads that holds only so much. It waits on condition variables, unlike the events
+// that the engine polls.
+#ifndef MOVIECONV_THREAD_BOUNDEDQUEUE_H
+#define MOVIECONV_THREAD_BOUNDEDQUEUE_H
+
+#include <condition_variable>
+#include <cstddef>
+#include <deque>
+#include <mutex>
+#include <optional>
+#include <utility>
+
+/// Items in the order they were pushed. All functions may be called on any thread.
+template <class Item>
+class BoundedQueue {
+public:
+    /// At most `maxItems` items that weigh at most `maxWeight` together; a single item may weigh more.
+    BoundedQueue(std::size_t maxItems, std::size_t maxWeight) : maxItems_(maxItems), maxWeight_(maxWeight) {}
+    BoundedQueue(const BoundedQueue&) = delete;
+    BoundedQueue& operator=(const BoundedQueue&) = delete;
+
+    /// Waits for room. False when the queue was finished or closed: the item is gone.
+    bool Push(Item item, std::size_t weight = 0) {
+        std::unique_lock lock(mutex_);
+        changed_.wait(lock, [&] { return finished_ || HasRoom(weight); });
+        if (finished_) {
+            return false;
+        }
+        items_.emplace_back(std::move(item), weight);
+        weight_ += weight;
+        lock.unlock();
+        changed_.notify_all();
+        return true;
+    }
+
+    /// Waits for an item. Nothing once the queue is closed, or finished and empty.
+    std::optional<Item> Pop() {
+        std::unique_lock lock(mutex_);
+        changed_.wait(lock, [&] { return finished_ || !items_.empty(); });
+        if (items_.empty()) {
+            return std::nullopt;
+        }
+        std::optional<Item> item(std::move(items_.front().first));
+        weight_ -= items_.front().second;
+        items_.pop_front();
+        lock.unlock();
+        changed_.notify_all();
+        return item;
+    }
+
+    /// No more items will come; those inside are still handed out.
+    void Finish() {
+        {
+            const std::lock_guard lock(mutex_);
+            finished_ = true;
+        }
+        changed_.notify_all();
+    }
+
+    /// Drops what is inside and wakes everyone who waits.
+    void Close() {
+        {
+            const std::lock_guard lock(mutex_);
+            finished_ = true;
+            items_.clear();
+            weight_ = 0;
+        }
+        changed_.notify_all();
+    }
+
+    std::size_t Size() const {
+        const std::lock_guard lock(mutex_);
+        return items_.size();
+    }
+
+private:
+    bool HasRoom(std::size_t weight) const {
+        return items_.empty() || (items_.size() < maxItems_ && weight_ + weight <= maxWeight_);
+    }
+
+    const std::size_t maxItems_;
+    const std::size_t maxWeight_;
+    mutable std::mutex mutex_;
+    std::condition_variable changed_;
+    std::deque<std::pair<Item, std::size_t>> items_;
+    std::size_t weight_ = 0;
+    bool finished_ = false;
+};
+
+#endif
