@@ -1,0 +1,319 @@
+// The exported conversions: their checks, where their rows lie, and the kernel that does the work.
+#include "Common/Image/ImageConvert.h"
+
+#include "Common/Image/Check.h"
+#include "Common/Image/PictureViews.h"
+#include "Common/Image/PixelEquations.h"
+#include "Common/Image/kernels/RowKernels.h"
+
+#include <algorithm>
+#include <cstring>
+
+namespace {
+
+using namespace image;
+
+enum class RowOrder { kTopDown, kBottomUp };
+
+/// A picture without rows when its size is zero or less.
+Picture MakePicture(uint8_t* bits, int64_t width, int64_t height, int64_t pitch, RowOrder order) {
+    if (width <= 0 || height <= 0)
+        return {};
+    const auto rows = static_cast<ptrdiff_t>(height);
+    const auto step = static_cast<ptrdiff_t>(pitch);
+    return {order == RowOrder::kBottomUp ? BottomUp(bits, step, rows) : Rows{bits, step},
+            static_cast<ptrdiff_t>(width), rows};
+}
+
+Picture Bitmap32(const tagBITMAPINFOHEADER* header, uint8_t* bits, RowOrder order) {
+    return MakePicture(bits, header->biWidth, header->biHeight, int64_t{4} * header->biWidth, order);
+}
+
+Picture Bitmap24(const tagBITMAPINFOHEADER* header, uint8_t* bits) {
+    const int64_t pitch = (int64_t{3} * header->biWidth + 3) & ~int64_t{3};
+    return MakePicture(bits, header->biWidth, header->biHeight, pitch, RowOrder::kBottomUp);
+}
+
+Planes420 MakePlanes(uint8_t* y, uint8_t* u, uint8_t* v, int pitchY, int pitchU, int pitchV) {
+    return {{y, pitchY}, {u, pitchU}, {v, pitchV}};
+}
+
+PackedOrder OrderOf(unsigned bYUY2) {
+    return bYUY2 != 0 ? kYuy2 : kUyvy;
+}
+
+ptrdiff_t EvenBelow(ptrdiff_t x) {
+    return x & ~ptrdiff_t{1};
+}
+ptrdiff_t EvenAbove(ptrdiff_t x) {
+    return EvenBelow(x + 1);
+}
+
+void Convert(To420 kernel, const Planes420& target, const Picture& source) {
+    ForRowPairs(source.height, [&](ptrdiff_t row0, ptrdiff_t row1, ptrdiff_t chroma) {
+        kernel(target.y.Targets(row0, row1), target.u[chroma], target.v[chroma],
+               source.rows.Sources(row0, row1), source.width);
+    });
+}
+
+void Convert(To420Alpha kernel, const Planes420& target, Rows alpha, const Picture& source) {
+    ForRowPairs(source.height, [&](ptrdiff_t row0, ptrdiff_t row1, ptrdiff_t chroma) {
+        kernel(target.y.Targets(row0, row1), target.u[chroma], target.v[chroma], alpha.Targets(row0, row1),
+               source.rows.Sources(row0, row1), source.width);
+    });
+}
+
+void Convert(From420 kernel, const Picture& target, const Planes420& source) {
+    ForRowPairs(target.height, [&](ptrdiff_t row0, ptrdiff_t row1, ptrdiff_t chroma) {
+        kernel(target.rows.Targets(row0, row1), source.y.Sources(row0, row1), source.u[chroma],
+               source.v[chroma], target.width);
+    });
+}
+
+void Convert(RowToRow kernel, Rows target, Rows source, ptrdiff_t width, ptrdiff_t height) {
+    for (ptrdiff_t row = 0; row < height; ++row)
+        kernel(target[row], source[row], width);
+}
+
+void Convert(DoubleRow kernel, Rows target, Rows source, ptrdiff_t width, ptrdiff_t height) {
+    for (ptrdiff_t row = 0; row < height; ++row)
+        kernel(target.Targets(2 * row, 2 * row + 1), source[row], width);
+}
+
+void Copy(Rows target, Rows source, ptrdiff_t bytes, ptrdiff_t height) {
+    ForRows(target, source, bytes, height, [](uint8_t* to, const uint8_t* from, ptrdiff_t count) {
+        std::memcpy(to, from, static_cast<size_t>(count));
+    });
+}
+
+} // namespace
+
+void Rgb32_2_yuv420(unsigned char* pY, unsigned char* pU, unsigned char* pV, int nPt_Y, int nPt_U, int nPt_V,
+                    tagBITMAPINFOHEADER* lpSrcBmi, unsigned char* lpSrcBits) {
+    CHECK_AT(652, lpSrcBmi && lpSrcBmi->biBitCount == 32);
+    CHECK_AT(653, lpSrcBits && pY && pU && pV);
+    Convert(BestRowKernels().bgr32To420, MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V),
+            Bitmap32(lpSrcBmi, lpSrcBits, RowOrder::kBottomUp));
+}
+
+void Argb_2_yuv420(unsigned char* pY, unsigned char* pU, unsigned char* pV, int nPt_Y, int nPt_U, int nPt_V,
+                   tagBITMAPINFOHEADER* lpSrcBmi, unsigned char* lpSrcBits) {
+    CHECK_AT(887, lpSrcBmi && lpSrcBmi->biBitCount == 32);
+    CHECK_AT(888, lpSrcBits && pY && pU && pV);
+    Convert(BestRowKernels().bgr32To420, MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V),
+            Bitmap32(lpSrcBmi, lpSrcBits, RowOrder::kTopDown));
+}
+
+void Rgb32_2_yuv420_Ex(unsigned char* pY, unsigned char* pU, unsigned char* pV, int nPt_Y, int nPt_U,
+                       int nPt_V, unsigned char* lpSrcBits, int nWidthSrc, int nHeightSrc, int nPitchSrc) {
+    CHECK_AT(761, lpSrcBits && pY && pU && pV);
+    const int64_t height = nHeightSrc;
+    const Picture source = height < 0
+                               ? MakePicture(lpSrcBits, nWidthSrc, -height, nPitchSrc, RowOrder::kBottomUp)
+                               : MakePicture(lpSrcBits, nWidthSrc, height, nPitchSrc, RowOrder::kTopDown);
+    Convert(BestRowKernels().bgr32To420, MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V), source);
+}
+
+void Rgb24_2_yuv420(unsigned char* pY, unsigned char* pU, unsigned char* pV, int nPt_Y, int nPt_U, int nPt_V,
+                    tagBITMAPINFOHEADER* lpSrcBmi, unsigned char* lpSrcBits) {
+    CHECK_AT(996, lpSrcBmi && lpSrcBmi->biBitCount == 24);
+    CHECK_AT(997, lpSrcBits && pY && pU && pV);
+    Convert(BestRowKernels().bgr24To420, MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V),
+            Bitmap24(lpSrcBmi, lpSrcBits));
+}
+
+void Rgb24_2_yuv420Simple(unsigned char* pY, unsigned char* pU, unsigned char* pV, int nPt_Y, int nPt_U,
+                          int nPt_V, tagBITMAPINFOHEADER* lpSrcBmi, unsigned char* lpSrcBits) {
+    Convert(BestRowKernels().bgr24To420Simple, MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V),
+            Bitmap24(lpSrcBmi, lpSrcBits).WholeBlocks());
+}
+
+void PixelRGB_2_YUV(int R, int G, int B, int& Y, int& U, int& V) {
+    Y = SimpleRgbToYuv::Y(R, G, B);
+    U = SimpleRgbToYuv::U(R, G, B);
+    V = SimpleRgbToYuv::V(R, G, B);
+    Y = std::clamp(Y, 16, 235);
+    U = std::clamp(U, 16, 240);
+    V = std::clamp(V, 16, 240);
+}
+
+void Rgb32_2_yuv420A(unsigned char* pY, unsigned char* pU, unsigned char* pV, unsigned char* pA, int nPt_Y,
+                     int nPt_U, int nPt_V, tagBITMAPINFOHEADER* lpSrcBmi, unsigned char* lpSrcBits,
+                     int bBottomUp) {
+    if (bBottomUp != 0) {
+        Rgb32_2_yuv420A_R(pY, pU, pV, pA, nPt_Y, nPt_U, nPt_V, lpSrcBmi, lpSrcBits);
+        return;
+    }
+    Convert(BestRowKernels().bgra32To420, MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V), Rows{pA, nPt_Y},
+            Bitmap32(lpSrcBmi, lpSrcBits, RowOrder::kTopDown));
+}
+
+void Rgb32_2_yuv420A_R(unsigned char* pY, unsigned char* pU, unsigned char* pV, unsigned char* pA, int nPt_Y,
+                       int nPt_U, int nPt_V, tagBITMAPINFOHEADER* lpSrcBmi, unsigned char* lpSrcBits) {
+    CHECK_AT(1683, lpSrcBmi && lpSrcBmi->biBitCount == 32);
+    CHECK_AT(1684, lpSrcBits && pY && pU && pV);
+    Convert(BestRowKernels().bgra32To420, MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V), Rows{pA, nPt_Y},
+            Bitmap32(lpSrcBmi, lpSrcBits, RowOrder::kBottomUp));
+}
+
+void Yuv420_2_rgb24(tagBITMAPINFOHEADER* lpDstBmi, unsigned char* lpDstBits, unsigned char* pY,
+                    unsigned char* pU, unsigned char* pV, int nPt_Y, int nPt_U, int nPt_V) {
+    CHECK_AT(283, lpDstBmi && lpDstBmi->biBitCount == 24);
+    CHECK_AT(284, lpDstBits && pY && pU && pV);
+    Convert(BestRowKernels().bgr24From420, Bitmap24(lpDstBmi, lpDstBits),
+            MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V));
+}
+
+void Yuv420_2_rgb32(tagBITMAPINFOHEADER* lpDstBmi, unsigned char* lpDstBits, unsigned char* pY,
+                    unsigned char* pU, unsigned char* pV, int nPt_Y, int nPt_U, int nPt_V) {
+    CHECK_AT(414, lpDstBmi && lpDstBmi->biBitCount == 32);
+    CHECK_AT(415, lpDstBits && pY && pU && pV);
+    Convert(BestRowKernels().bgrxFrom420, Bitmap32(lpDstBmi, lpDstBits, RowOrder::kBottomUp),
+            MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V));
+}
+
+void Yuv420_2_Argb(tagBITMAPINFOHEADER* lpDstBmi, unsigned char* lpDstBits, unsigned char* pY,
+                   unsigned char* pU, unsigned char* pV, int nPt_Y, int nPt_U, int nPt_V) {
+    CHECK_AT(529, lpDstBmi && lpDstBmi->biBitCount == 32);
+    CHECK_AT(530, lpDstBits && pY && pU && pV);
+    Convert(BestRowKernels().bgraFrom420, Bitmap32(lpDstBmi, lpDstBits, RowOrder::kTopDown),
+            MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V));
+}
+
+void Yuv420_2_rgb24Simple(tagBITMAPINFOHEADER* lpDstBmi, unsigned char* lpDstBits, unsigned char* pY,
+                          unsigned char* pU, unsigned char* pV, int nPt_Y, int nPt_U, int nPt_V) {
+    Convert(BestRowKernels().bgr24From420Simple, Bitmap24(lpDstBmi, lpDstBits).WholeBlocks(),
+            MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V));
+}
+
+void PixelYUV_2_RGB(int Y, int U, int V, int& R, int& G, int& B) {
+    using E = SimpleYuvToRgb;
+    const int64_t luma = E::Luma(Y);
+    R = Component<E>(luma, E::Red(V));
+    G = Component<E>(luma, E::Green(U, V));
+    B = Component<E>(luma, E::Blue(U));
+    R = std::clamp(R, 0, 255);
+    G = std::clamp(G, 0, 255);
+    B = std::clamp(B, 0, 255);
+}
+
+namespace {
+
+/// The checks of Rgb24_2_YUY2 in arithmetic that no argument can overflow.
+void CheckRgb24_2_YUY2(const uint8_t* lpBitsDst, int64_t nPitchDst, int64_t xDst, int64_t cxDst,
+                       const uint8_t* lpBitsSrc, int64_t nPitchSrc, int64_t xSrc) {
+    CHECK_AT(1110, lpBitsDst && lpBitsSrc);
+    CHECK_AT(1111, (xDst + cxDst) * 2 <= nPitchDst);
+    CHECK_AT(1112, nPitchSrc / 3 - xSrc >= cxDst);
+}
+
+} // namespace
+
+void Rgb24_2_YUY2(unsigned char* lpBitsDst, int nPitchDst, int xDst, int yDst, int cxDst, int cyDst,
+                  unsigned int bYUY2, unsigned char* lpBitsSrc, int nHeightSrc, int nPitchSrc, int xSrc,
+                  int ySrc) {
+    CheckRgb24_2_YUY2(lpBitsDst, nPitchDst, xDst, cxDst, lpBitsSrc, nPitchSrc, xSrc);
+    if (cxDst <= 0 || cyDst <= 0)
+        return;
+    const ptrdiff_t start = EvenBelow(xDst);
+    Convert(BestRowKernels().packedFromBgr24[OrderOf(bYUY2)], Rows{lpBitsDst, nPitchDst}.At(yDst, 2 * start),
+            BottomUp(lpBitsSrc, nPitchSrc, nHeightSrc).At(ySrc, ptrdiff_t{3} * xSrc), cxDst + (xDst - start),
+            cyDst);
+}
+
+void YUY2_2_Rgb24(unsigned char* lpBitsDst, int nHeightDst, int nPitchDst, int xDst, int yDst, int cx, int cy,
+                  unsigned char* lpBitsSrc, int nPitchSrc, unsigned int bYUY2, int xSrc, int ySrc) {
+    CHECK_AT(1232, lpBitsDst && lpBitsSrc);
+    if (cx <= 0 || cy <= 0)
+        return;
+    Convert(BestRowKernels().bgr24FromPacked[OrderOf(bYUY2)],
+            BottomUp(lpBitsDst, nPitchDst, nHeightDst).At(yDst, ptrdiff_t{3} * xDst),
+            Rows{lpBitsSrc, nPitchSrc}.At(ySrc, 2 * EvenBelow(xSrc)), cx, cy);
+}
+
+void YUY2_2_Yuv420(unsigned char* pY, unsigned char* pU, unsigned char* pV, int nPt_Y, int nPt_U, int nPt_V,
+                   int xDst, int yDst, int cx, int cy, unsigned char* lpBitsSrc, int nPitchSrc,
+                   unsigned int bYUY2, int xSrc, int ySrc) {
+    if (cx <= 0 || cy <= 0)
+        return;
+    const To420 kernel = BestRowKernels().packedTo420[OrderOf(bYUY2)];
+    const Planes420 target = MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V).At(xDst, yDst);
+    const Rows source = Rows{lpBitsSrc, nPitchSrc}.At(ySrc, 2 * EvenBelow(xSrc));
+    const int64_t lastAllowed = (int64_t{ySrc} + cy) * nPt_V;
+    ForRowPairs(EvenAbove(cy), [&](ptrdiff_t row0, ptrdiff_t row1, ptrdiff_t chroma) {
+        // The groups of this pair of rows whose V sample may be written: each is checked before it is.
+        const int64_t firstSample = (int64_t{yDst / 2} + chroma) * nPt_V + xDst / 2;
+        const int64_t groups = EvenAbove(cx) / 2;
+        const int64_t allowed = std::clamp<int64_t>(lastAllowed - firstSample + 1, 0, groups);
+        kernel(target.y.Targets(row0, row1), target.u[chroma], target.v[chroma], source.Sources(row0, row1),
+               static_cast<ptrdiff_t>(2 * allowed));
+        if (allowed < groups)
+            CheckFailed(1452, "(char*)V <= ((char*)pV + (ySrc + cy) * nPt_V)");
+    });
+}
+
+void Yuv420_2_YUY2(unsigned char* lpBitsDst, int nPitchDst, int xDst, int yDst, int cx, int cy,
+                   unsigned int bYUY2, unsigned char* pY, unsigned char* pU, unsigned char* pV, int nPt_Y,
+                   int nPt_U, int nPt_V, int xSrc, int ySrc) {
+    if (cx <= 0 || cy <= 0)
+        return;
+    const Rows target = Rows{lpBitsDst, nPitchDst}.At(yDst, 2 * EvenBelow(xDst));
+    Convert(BestRowKernels().packedFrom420[OrderOf(bYUY2)], Picture{target, EvenAbove(cx), EvenAbove(cy)},
+            MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V).At(xSrc, ySrc));
+}
+
+void YV12_Blt_fast(unsigned char* pYDst, unsigned char* pUDst, unsigned char* pVDst, int nPt_YDst,
+                   int nPt_UDst, int nPt_VDst, int xDst, int yDst, int cx, int cy, unsigned char* pYSrc,
+                   unsigned char* pUSrc, unsigned char* pVSrc, int nPt_YSrc, int nPt_USrc, int nPt_VSrc,
+                   int xSrc, int ySrc) {
+    if (cx <= 0 || cy <= 0)
+        return;
+    const ptrdiff_t rows = EvenAbove(cy);
+    const ptrdiff_t chromaWidth = EvenAbove(cx) / 2;
+    const ptrdiff_t chromaDst = (ptrdiff_t{xDst} + 1) / 2;
+    const ptrdiff_t chromaSrc = (ptrdiff_t{xSrc} + 1) / 2;
+    Copy(Rows{pYDst, nPt_YDst}.At(yDst, xDst), Rows{pYSrc, nPt_YSrc}.At(ySrc, xSrc), cx, rows);
+    Copy(Rows{pUDst, nPt_UDst}.At(yDst / 2, chromaDst), Rows{pUSrc, nPt_USrc}.At(ySrc / 2, chromaSrc),
+         chromaWidth, rows / 2);
+    Copy(Rows{pVDst, nPt_VDst}.At(yDst / 2, chromaDst), Rows{pVSrc, nPt_VSrc}.At(ySrc / 2, chromaSrc),
+         chromaWidth, rows / 2);
+}
+
+void YUY2_Blt_fast(unsigned char* lpBitsDst, int nPitchDst, int xDst, int yDst, int cx, int cy,
+                   unsigned int bYUY2Dst, unsigned char* lpBitsSrc, int nPitchSrc, unsigned int bYUY2Src,
+                   int xSrc, int ySrc) {
+    if (cx <= 0 || cy <= 0)
+        return;
+    const Rows target = Rows{lpBitsDst, nPitchDst}.At(yDst, ptrdiff_t{2} * xDst);
+    const Rows source = Rows{lpBitsSrc, nPitchSrc}.At(ySrc, ptrdiff_t{2} * xSrc);
+    if (bYUY2Dst == bYUY2Src) {
+        Copy(target, source, ptrdiff_t{2} * cx, cy);
+        return;
+    }
+    const RowToRow swap = BestRowKernels().swapPacked;
+    ForRows(target, source, 2 * EvenAbove(cx), cy,
+            [swap](uint8_t* to, const uint8_t* from, ptrdiff_t bytes) { swap(to, from, bytes / 2); });
+}
+
+void YUV444_2_420(unsigned char* pDst, unsigned char* pSrc, int cx, int cy) {
+    if (cx <= 0 || cy <= 0)
+        return;
+    const HalveRows halve = BestRowKernels().halve;
+    const Rows target{pDst, EvenAbove(cx) / 2};
+    const Rows source{pSrc, cx};
+    ForRowPairs(cy, [&](ptrdiff_t row0, ptrdiff_t row1, ptrdiff_t half) {
+        halve(target[half], source.Sources(row0, row1), cx);
+    });
+}
+
+void YUV420_2_444(unsigned char* pDst, unsigned char* pSrc, int w, int h) {
+    if (w <= 0 || h <= 0)
+        return;
+    Convert(BestRowKernels().doubled, Rows{pDst, ptrdiff_t{2} * w}, Rows{pSrc, w}, w, h);
+}
+
+void YUV420_2_444Ex(unsigned char* pDst, unsigned char* pSrc, int W, int H) {
+    if (W <= 1 || H <= 1)
+        return;
+    Convert(BestRowKernels().doubled, Rows{pDst, W}, Rows{pSrc, EvenAbove(W) / 2}, W / 2, H / 2);
+}
