@@ -1,0 +1,110 @@
+#include "api/MovieConv.h"
+
+#include "engine/ConvThread.h"
+#include "engine/Estimate.h"
+
+#include <new>
+
+static_assert(MC_MAX_TARGET_NAME == kClipNameSize);
+static_assert(MC_INFINITE == kWaitInfinite && MC_WAIT_TIMEOUT == kWaitTimeout);
+
+namespace {
+
+/// Calls `operation` on the converter behind a handle. Without a converter, and when it throws, the result is
+/// `failure`.
+template <class Result, class Operation>
+Result Call(MCHandle converter, Result failure, Operation operation) noexcept {
+    if (!converter)
+        return failure;
+    try {
+        return operation(*static_cast<ConvThread*>(converter));
+    } catch (...) {
+        return failure;
+    }
+}
+
+} // namespace
+
+MCHandle MCCreate(VideoDecoder* video, AudioDecoder* audio) {
+    if (!video && !audio)
+        return nullptr;
+    try {
+        return new ConvThread(video, audio);
+    } catch (...) {
+        return nullptr;
+    }
+}
+
+void MCDestroy(MCHandle converter) {
+    delete static_cast<ConvThread*>(converter);
+}
+
+int MCSetEncodeParam(MCHandle converter, const EncodeParam* param) {
+    return Call(converter, 0, [=](ConvThread& c) { return c.SetEncodeParam(param); });
+}
+
+int MCGetEncodeParam(MCHandle converter, EncodeParam* out) {
+    return Call(converter, 0, [=](ConvThread& c) { return c.GetEncodeParam(out); });
+}
+
+int MCSetOutputFile(MCHandle converter, const wchar_t* path) {
+    return Call(converter, 0, [=](ConvThread& c) { return c.SetOutputFile(path); });
+}
+
+int MCSetSplitParam(MCHandle converter, int mode, unsigned long value) {
+    return Call(converter, 0, [=](ConvThread& c) { return c.SetSplitParam(mode, value); });
+}
+
+unsigned MCEnablePreview(MCHandle converter, unsigned enable) {
+    return Call(converter, 0U, [=](ConvThread& c) { return c.EnablePreview(enable); });
+}
+
+long long MCGetEstimateDiskSpace(MCHandle converter) {
+    return Call(converter, 0LL, [](ConvThread& c) { return c.GetEstimateDiskSpace(); });
+}
+
+long long MCGetEstimateDiskSpaceEx(const EncodeParam* param, double seconds) {
+    return EstimateDiskSpace(param, seconds);
+}
+
+long long MCGetDiskFreeSpace(const wchar_t* path) {
+    return ConvThread::GetDiskFreeSpace(path);
+}
+
+int MCStart(MCHandle converter, double begin, double length, OpaqueWindowPtr* window,
+            ProgressCallback callback, void* context) {
+    return Call(converter, -1,
+                [=](ConvThread& c) { return c.Start(begin, length, window, callback, context); });
+}
+
+int MCPause(MCHandle converter) {
+    return Call(converter, 0, [](ConvThread& c) { return c.Pause(); });
+}
+
+int MCResume(MCHandle converter) {
+    return Call(converter, 0, [](ConvThread& c) { return c.Resume(); });
+}
+
+int MCStop(MCHandle converter) {
+    return Call(converter, 0, [](ConvThread& c) { return c.Stop(0, 0); });
+}
+
+int MCAbort(MCHandle converter) {
+    return Call(converter, 0, [](ConvThread& c) { return c.Abort(0, 0); });
+}
+
+int MCWait(MCHandle converter, unsigned timeoutMs) {
+    return Call(converter, -1, [=](ConvThread& c) { return static_cast<int>(c.Wait(timeoutMs)); });
+}
+
+int MCSetThreadPriority(MCHandle /*converter*/, int /*priority*/) {
+    return 0;
+}
+
+int MCGetTargetCount(MCHandle converter) {
+    return Call(converter, 0, [](ConvThread& c) { return c.GetTargetCount(); });
+}
+
+int MCGetTargetFileName(MCHandle converter, wchar_t* buffer, int index) {
+    return Call(converter, 0, [=](ConvThread& c) { return c.GetTargetFileName(buffer, index); });
+}

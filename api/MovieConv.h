@@ -1,0 +1,165 @@
+// The interface of MovieConv, the one header that a host includes.
+//
+// A converter takes the pictures and the sound of one opened movie from two decoders of the host, puts both
+// on one timeline and has the media writer make a file of them, or a series of clips, on a worker thread of
+// its own:
+//
+//     MCHandle converter = MCCreate(video, audio);
+//     MCSetOutputFile(converter, L"/tmp/out.mp4");
+//     MCStart(converter, 0.0, 0.0, NULL, callback, context);
+//     MCWait(converter, MC_INFINITE);
+//     MCDestroy(converter);
+//
+// The MC functions are C. Behind them follows what only C++ can use: the decoders that a host derives its own
+// from, helpers, and the colour routines.
+//
+// Threads. A converter belongs to the host's thread that made it. MCPause, MCResume, MCAbort, MCStop, MCWait,
+// MCEnablePreview, MCGetEncodeParam and the MCGet... queries may be called from any thread and at any time
+// between MCCreate and MCDestroy; everything else while the converter does not run. The progress callback
+// comes on the worker thread. It may call whatever does not wait for that thread: not MCStop, MCWait or
+// MCDestroy.
+//
+// Errors. A null handle does nothing and gives 0, from MCStart and MCWait -1. So does a lack of memory. No
+// exception leaves these functions, and none may come out of a decoder or a callback.
+#ifndef MOVIECONV_API_MOVIECONV_H
+#define MOVIECONV_API_MOVIECONV_H
+
+#include "engine/ProgressInfo.h"
+#include "media/EncodeParam.h"
+#include "media/FourCC.h"
+#include "media/MediaRecords.h"
+#include "media/ProgressCallback.h"
+#include "platform/Platform.h"
+
+#include <wchar.h>
+
+#ifdef __cplusplus
+#include "media/Decoders.h"
+extern "C" {
+#else
+typedef struct VideoDecoder VideoDecoder; // C++ classes, which C code can only hand on
+typedef struct AudioDecoder AudioDecoder;
+#endif
+
+/// A converter, from MCCreate to MCDestroy.
+typedef void* MCHandle;
+
+enum {
+    MC_MAX_TARGET_NAME = 512 ///< Characters of a clip name, its terminator included.
+};
+
+#define MC_INFINITE 0xFFFFFFFFu ///< For MCWait: no limit.
+#define MC_WAIT_TIMEOUT 258     ///< From MCWait: the time ran out.
+#define MC_CANNOT_OPEN_SOURCE 3 ///< From MCStart: the video source could not be opened.
+
+#pragma GCC visibility push(default)
+
+// ---- Making a converter
+
+/// Makes a converter for one opened movie. Either decoder may be null. The decoders stay the host's and must
+/// outlive the converter; what they describe becomes the default picture size, frame rate, sample rate and
+/// channel count. Null when both decoders are null or there is no memory.
+MCHandle MCCreate(VideoDecoder* video, AudioDecoder* audio);
+
+/// Stops a running conversion, waits for its end and frees the converter. Null does nothing.
+void MCDestroy(MCHandle converter);
+
+// ---- Before a conversion
+
+/// Sets the encoding parameters. Picture size, frame rate, sample rate, channels, bits per sample and bit
+/// rates that are 0 are completed from the source, and a stream that the file format cannot carry is switched
+/// off. A frame rate above 200 becomes 30 when there is a video decoder. Null completes the parameters that
+/// are set. Always 1.
+int MCSetEncodeParam(MCHandle converter, const EncodeParam* param);
+
+/// Copies the parameters in force to `out`, if it is not null. A stream that the last conversion did not find
+/// is switched off in them. Always 1.
+int MCGetEncodeParam(MCHandle converter, EncodeParam* out);
+
+/// Sets the name of the output file. It is not checked; the media writer creates the file when the conversion
+/// starts. Null stands for an empty name. Always 1.
+int MCSetOutputFile(MCHandle converter, const wchar_t* path);
+
+/// With `mode` 1, splits the output into clips of at least `value` milliseconds, in conversions that write
+/// pictures; with any other, writes one file. From 2^31 on a value is taken for negative, which closes a clip
+/// after every picture.
+///
+/// A clip is named as the output file with "_" and its number before the extension: out_00.mp4, out_01.mp4,
+/// ... The numbers go on in later conversions. A name that would grow beyond MC_MAX_TARGET_NAME, or an
+/// extension of 20 or more characters, ends the conversion with kOutcomeFailed.
+///
+/// 1, or 0 without effect while the converter runs or is paused.
+int MCSetSplitParam(MCHandle converter, int mode, unsigned long value);
+
+/// Nonzero: progress records carry the picture just written. On at first; takes effect at once, also while
+/// running. Never in conversions of sound alone, nor of pictures alone into the file format "COPY". Returns
+/// `enable`.
+unsigned MCEnablePreview(MCHandle converter, unsigned enable);
+
+/// Size in bytes that the whole source is going to take with the parameters in force, for at most ten hours
+/// of it.
+long long MCGetEstimateDiskSpace(MCHandle converter);
+
+/// Size in bytes of `seconds` of output with `param`. 0 when `param` is null or `seconds` is below 0.00001.
+long long MCGetEstimateDiskSpaceEx(const EncodeParam* param, double seconds);
+
+/// 4294967295 for a path, 0 for null and for "". The file system is not asked.
+long long MCGetDiskFreeSpace(const wchar_t* path);
+
+// ---- A conversion
+
+/// Starts the conversion of `length` seconds from `begin` on; a length below 0.001 means all the rest.
+///
+/// The news comes in two ways: `callback`, unless it is null, is called on the worker thread with `context`,
+/// and events of class 5000 and kind 'kind' go to the main event queue, with `window` (which may be null) as
+/// 32-bit parameter 'HWND', 0 or 100 as 'WPAM' and the progress or the outcome as 'LPAM'. Progress events
+/// come only with a callback.
+///
+/// 0 when started, and without effect when the converter runs already; MC_CANNOT_OPEN_SOURCE. Everything that
+/// goes wrong later is told by the outcome.
+int MCStart(MCHandle converter, double begin, double length, OpaqueWindowPtr* window,
+            ProgressCallback callback, void* context);
+
+/// Pauses a running conversion. Pauses nest. Returns the count of pauses after the call; a conversion that is
+/// being stopped is not paused any more.
+int MCPause(MCHandle converter);
+
+/// Takes one pause back; the conversion goes on with the last one. Returns the count of pauses after the
+/// call.
+int MCResume(MCHandle converter);
+
+/// Ends the conversion and waits for its end. What was written so far is closed as a file. Always 0.
+int MCStop(MCHandle converter);
+
+/// Asks the conversion to end and does not wait. 1 when it was running or paused, else 0.
+int MCAbort(MCHandle converter);
+
+/// Waits at most `timeoutMs` milliseconds for the end of the conversion. 0 when it has ended or none was
+/// started, else MC_WAIT_TIMEOUT.
+int MCWait(MCHandle converter, unsigned timeoutMs);
+
+/// Does nothing: the worker's priority is never changed. Always 0.
+int MCSetThreadPriority(MCHandle converter, int priority);
+
+// ---- Clips
+
+/// The number of clips begun so far, of all conversions of this converter together.
+int MCGetTargetCount(MCHandle converter);
+
+/// Copies the name of clip `index`, from 0, to `buffer`, which must hold MC_MAX_TARGET_NAME characters. 1, or
+/// 0 with `buffer` untouched when there is no such clip.
+int MCGetTargetFileName(MCHandle converter, wchar_t* buffer, int index);
+
+#pragma GCC visibility pop
+
+#ifdef __cplusplus
+} // extern "C"
+
+// ---- C++ only
+
+#include "Common/Image/ImageConvert.h"
+#include "engine/AudioHelpers.h"
+#include "engine/PostMessage.h"
+#endif
+
+#endif

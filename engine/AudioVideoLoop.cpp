@@ -1,0 +1,230 @@
+// Pictures and sound. Each iteration takes a picture, writes the sound up to it and then the picture. The
+// sound is the master clock: its stamps count the bytes written, and a picture is shifted as the last sound
+// block before it was. Where the sound has ended, silence takes its place.
+#include "engine/Arithmetic.h"
+#include "engine/Conversion.h"
+#include "engine/SourceFormat.h"
+#include "log/dyLog.h"
+#include "media/MediaWriter.h"
+#include "thread/Clock.h"
+
+#include <algorithm>
+#include <new>
+
+namespace {
+
+constexpr int64_t kTicksPerSecond = 10000000;
+constexpr int32_t kSilenceStep = 400000; // 40 ms
+constexpr int32_t kSilenceSize = 1 << 20;
+
+/// Iterations between two progress notifications.
+int32_t NotifyInterval(int32_t totalFrames) {
+    return std::clamp(totalFrames / 7500, 3, 45);
+}
+
+} // namespace
+
+class ConvThread::AudioVideoLoop : Conversion {
+public:
+    explicit AudioVideoLoop(ConvThread& owner) : Conversion(owner) {}
+
+    int Run();
+
+private:
+    unsigned Iterate();
+    void WriteSound(const VideoImage* picture);
+    void WriteBlock(const AudioFrame& block, int64_t pictureTime);
+    bool WriteSilence(const VideoImage* picture);
+    void WriteSilence(int32_t gap);
+    void WritePicture(const VideoImage& picture);
+    void Estimate(uint32_t now);
+    bool LastPictureReached() const { return int64_t{nFrame} >= int64_t{nTotalFrames} - 1; }
+    bool NotificationDue() const;
+
+    double dSourceRate = 0.0;    // pictures per second
+    int32_t nTotalFrames = 0;    // iterations that the conversion is expected to take
+    int32_t nNotifyInterval = 0; // iterations
+    int32_t nFrame = 0;          // iteration
+    int32_t nLastEstimateFrame = -1;
+    bool bAudioDone = false;
+    bool bVideoDone = false;
+
+    // Time stamps count 100 ns.
+    bool bSoundBegun = false;
+    int64_t llAudioOrigin = -1; // distance of the first block from the first picture
+    int64_t llAudioOut = -1;    // output stamp of the next block
+    int64_t llAudioSrc = -1;    // source stamp of the last block
+    int64_t llVideoShift = 0;   // from source to output
+    int64_t llAudioBytes = 0;   // sound in the current file
+
+    std::unique_ptr<unsigned char[]> silence;
+};
+
+int ConvThread::process() {
+    return AudioVideoLoop(*this).Run();
+}
+
+int ConvThread::AudioVideoLoop::Run() {
+    pVideoFormat = SourceFormat(converter.pVideoDecoder);
+    pAudioFormat = SourceFormat(converter.pAudioDecoder);
+    if (!pVideoFormat || !pAudioFormat || !CreateFirstFile())
+        return ReportFailure();
+    const double begin = BeginTime();
+    if (begin > 0.0) {
+        converter.pVideoDecoder->Seek(begin, 1);
+        converter.pAudioDecoder->Seek(begin);
+    }
+    dSourceRate = pVideoFormat->dFrameRate;
+    nTotalFrames = Truncate<int32_t>(dSourceRate * converter.dConvLength + 0.5);
+    nNotifyInterval = NotifyInterval(nTotalFrames);
+    StartClock();
+
+    const unsigned outcome = Iterate();
+
+    silence.reset();
+    return Finish(outcome, converter.dConvLength);
+}
+
+unsigned ConvThread::AudioVideoLoop::Iterate() {
+    for (;; nFrame = WrapAdd(nFrame, 1)) {
+        if (StopRequested())
+            return kOutcomeStopped;
+        if (LengthReached() || (bAudioDone && bVideoDone))
+            return kOutcomeCompleted;
+        if (!CreateDueClip())
+            return kOutcomeFailed;
+
+        VideoImage* picture = converter.pVideoDecoder->GetCurrentImage();
+        if (!picture)
+            bVideoDone = true;
+        if (!bAudioDone)
+            WriteSound(picture);
+        else if (!WriteSilence(picture))
+            return kOutcomeFailed;
+        if (!bVideoDone)
+            WritePicture(*picture);
+
+        const uint32_t now = MillisecondClock();
+        Estimate(now);
+        if (!bVideoDone) {
+            if (NotificationDue() && !NotifyProgress(now, converter.bPreview ? picture : nullptr))
+                return kOutcomeCancelled;
+            bVideoDone = converter.pVideoDecoder->DecodeNext(1) < 1;
+        }
+        if (ClipFull()) {
+            CloseClip();
+            llAudioOut = 0;
+            llAudioBytes = 0;
+        }
+    }
+}
+
+// Writes the sound up to and including the first block that starts at or after the picture; all the rest once
+// the pictures have ended.
+void ConvThread::AudioVideoLoop::WriteSound(const VideoImage* picture) {
+    while (bVideoDone || llAudioSrc < picture->llTime) {
+        if (LengthReached())
+            return;
+        const AudioFrame* block = converter.pAudioDecoder->GetNextFrame();
+        if (!block || block->nLength == 0) {
+            bAudioDone = true;
+            return;
+        }
+        WriteBlock(*block, picture ? picture->llTime : 0);
+    }
+}
+
+void ConvThread::AudioVideoLoop::WriteBlock(const AudioFrame& block, int64_t pictureTime) {
+    if (!bSoundBegun) {
+        bSoundBegun = true;
+        llAudioOrigin = WrapSub(block.llTime, pictureTime);
+        llAudioOut = llAudioOrigin;
+    }
+    AudioFrame copy = block;
+    copy.llTime2 = llAudioOut;
+    copy.llTime = llAudioOut;
+    MWWriteAudioData(hFile, &copy);
+
+    llAudioSrc = block.llTime;
+    llVideoShift = WrapSub(llAudioOut, llAudioSrc);
+    llAudioBytes = WrapAdd<int64_t>(llAudioBytes, block.nLength);
+    const int32_t bytesPerSecond = pAudioFormat->nBytesPerSecond;
+    llAudioOut = llAudioOrigin;
+    if (bytesPerSecond > 0) { // bytes of no known rate take no time
+        dPosition += static_cast<double>(block.nLength) / bytesPerSecond;
+        llAudioOut = WrapAdd(WrapMul(llAudioBytes, kTicksPerSecond) / bytesPerSecond, llAudioOrigin);
+    }
+}
+
+// Covers the source time from the last block's stamp to the picture's. False without memory for it.
+bool ConvThread::AudioVideoLoop::WriteSilence(const VideoImage* picture) {
+    if (!picture) {
+        if (dSourceRate > 0.0)
+            dPosition += 1.0 / dSourceRate;
+        return true;
+    }
+    if (!silence) {
+        silence.reset(new (std::nothrow) unsigned char[kSilenceSize]());
+        if (!silence) {
+            LogEx(L"MovieConv::No memory for silence.\r\n");
+            return false;
+        }
+    }
+    const auto gap =
+        static_cast<int32_t>(static_cast<uint32_t>(picture->llTime) - static_cast<uint32_t>(llAudioSrc));
+    if (gap > 0)
+        WriteSilence(gap);
+    return true;
+}
+
+void ConvThread::AudioVideoLoop::WriteSilence(int32_t gap) {
+    const EncodeParam& param = converter.encodeParam;
+    AudioFrame block{};
+    block.nType = kMediaTypeSilence;
+    block.nSampleRate = param.nSampleRate;
+    block.nChannels = param.nChannels;
+    block.nBitsPerSample = param.nBitsPerSample;
+    block.pData = silence.get();
+    block.nBufferSize = kSilenceSize;
+    block.llTime2 = llAudioOut;
+    block.llTime = llAudioOut;
+    for (int32_t covered = 0; covered < gap; covered += block.nDuration) {
+        const int32_t step = std::min(gap - covered, kSilenceStep);
+        const double bytes =
+            step / 10000000.0 * param.nSampleRate * param.nChannels * param.nBitsPerSample * 0.125;
+        block.nLength = std::clamp(Truncate<int32_t>(bytes + 0.5), 0, kSilenceSize);
+        block.nDuration = step;
+        MWWriteAudioData(hFile, &block);
+        llAudioBytes += block.nLength;
+        block.llTime2 = WrapAdd<int64_t>(block.llTime2, step);
+        block.llTime = WrapAdd<int64_t>(block.llTime, step);
+        llAudioSrc = WrapAdd<int64_t>(llAudioSrc, step);
+    }
+    llAudioOut = WrapAdd<int64_t>(llAudioOut, gap);
+    dPosition += gap / 10000000.0;
+}
+
+void ConvThread::AudioVideoLoop::WritePicture(const VideoImage& picture) {
+    VideoImage copy = picture;
+    copy.llTime2 = WrapAdd(copy.llTime2, llVideoShift);
+    copy.llTime = WrapAdd(copy.llTime, llVideoShift);
+    MWWriteVideoFrame(hFile, &copy);
+}
+
+void ConvThread::AudioVideoLoop::Estimate(uint32_t now) {
+    if (!EstimateDue(now) && !LastPictureReached())
+        return;
+    const uint32_t since = now - tLastEstimate;
+    const int32_t frame = WrapSub(nFrame, 1);
+    int32_t frames = WrapSub(frame, nLastEstimateFrame);
+    if (frames == 1 && nFrame <= 1)
+        frames = 5;
+    dRemaining = (static_cast<double>(nTotalFrames) - frame) * (since / 1000.0) / frames;
+    dSpeed = frames * 1000.0 / since / dSourceRate;
+    tLastEstimate = now;
+    nLastEstimateFrame = frame;
+}
+
+bool ConvThread::AudioVideoLoop::NotificationDue() const {
+    return converter.pfnProgress && (WrapSub(nFrame, 1) % nNotifyInterval == 0 || LastPictureReached());
+}

@@ -1,0 +1,61 @@
+// Splitting the output into clips, and their names.
+#include "engine/ConvThread.h"
+#include "log/dyLog.h"
+#include "thread/SingleLock.h"
+
+#include <algorithm>
+#include <cwchar>
+#include <exception>
+
+namespace {
+
+constexpr size_t kExtensionSize = 20; // characters, the dot and the terminator included
+
+/// Puts "_", the number and the extension in place of `file`'s extension, which begins at the last dot of the
+/// whole name. False when the file name, its extension or the clip name is too long: a cut name would be
+/// another clip's.
+bool FormatClipName(wchar_t* name, const std::wstring& file, size_t number) {
+    const size_t baseLength = std::min(file.rfind(L'.'), file.size());
+    if (file.size() >= kClipNameSize || file.size() - baseLength >= kExtensionSize)
+        return false;
+    return swprintf(name, kClipNameSize, L"%.*ls_%02d%ls", static_cast<int>(baseLength), file.c_str(),
+                    static_cast<int>(number), file.c_str() + baseLength) > 0;
+}
+
+} // namespace
+
+int ConvThread::SetSplitParam(int mode, unsigned long value) {
+    if (IsActive())
+        return 0;
+    nSplitMode = mode;
+    nSplitValue = static_cast<uint32_t>(std::min<unsigned long>(value, UINT32_MAX));
+    return 1;
+}
+
+wchar_t* ConvThread::CreateNewClip() {
+    try {
+        auto name = std::make_unique<wchar_t[]>(kClipNameSize);
+        if (!FormatClipName(name.get(), strOutputFile, vecTargetNames.size())) {
+            LogEx(L"MovieConv::CreateNewClip(): output name too long for clips.\r\n");
+            return nullptr;
+        }
+        const CSingleLock guard(&sharedLock);
+        return vecTargetNames.emplace_back(std::move(name)).get();
+    } catch (const std::exception&) {
+        LogEx(L"MovieConv::CreateNewClip(): no memory for a clip name.\r\n");
+        return nullptr;
+    }
+}
+
+int ConvThread::GetTargetCount() const {
+    const CSingleLock guard(&sharedLock);
+    return static_cast<int>(vecTargetNames.size());
+}
+
+int ConvThread::GetTargetFileName(wchar_t* buffer, int index) const {
+    const CSingleLock guard(&sharedLock);
+    if (!buffer || index < 0 || static_cast<size_t>(index) >= vecTargetNames.size())
+        return 0;
+    std::wcscpy(buffer, vecTargetNames[static_cast<size_t>(index)].get());
+    return 1;
+}

@@ -1,0 +1,145 @@
+// Starting, steering and ending a conversion, and the worker's choice of a loop.
+#include "engine/ConvThread.h"
+#include "engine/ProgressInfo.h"
+#include "engine/SourceFormat.h"
+#include "log/dyLog.h"
+#include "thread/SingleLock.h"
+
+#include <algorithm>
+
+namespace {
+
+constexpr double kMinSourceDuration = 0.001; // seconds; what is shorter counts as empty
+constexpr double kMinLength = 0.001;         // seconds; what is shorter means all the rest
+constexpr int kCannotOpenSource = 3;
+
+template <class Decoder>
+bool IsEmpty(Decoder* decoder) {
+    return SourceDuration(decoder) < kMinSourceDuration;
+}
+
+/// The longer of the two streams, in seconds. Pictures without a rate do not count.
+double LongestDuration(VideoDecoder* video, AudioDecoder* audio) {
+    double duration = 0.0;
+    const VideoFormat* pictures = SourceFormat(video);
+    if (pictures && pictures->dFrameRate > 0.0001)
+        duration = pictures->dDuration;
+    if (const AudioFormat* sound = SourceFormat(audio))
+        duration = std::max(sound->dDuration, duration);
+    return duration;
+}
+
+void LogDiskSpace(long long estimate, long long freeSpace, const wchar_t* outputFile) {
+    LogEx(L"MovieConv::Estimate Space[%lld Bytes];", estimate);
+    LogEx(L"MovieConv::Disk Free Space[%lld Bytes];", freeSpace);
+    if (freeSpace < estimate)
+        LogEx(L"Without enough Disk space to generate file[%ls].\r\n", outputFile);
+}
+
+} // namespace
+
+int ConvThread::Start(double begin, double length, OpaqueWindowPtr* window, ProgressCallback callback,
+                      void* context) {
+    if (IsActive())
+        return 0;
+    dBeginTime = begin;
+    dLength = length;
+    LogEx(L"MovieConv::StartThread(): BeginTime[%0.3fs], Length[%0.3fs]", begin, length);
+    if (!pVideoDecoder)
+        Log(L"MovieConv::Without Video Decoder.");
+    if (!pAudioDecoder)
+        Log(L"MovieConv::Without Audio Decoder.");
+
+    const double rest = LongestDuration(pVideoDecoder, pAudioDecoder) - begin;
+    dConvLength = length < kMinLength || length > rest ? rest : length;
+    if (!pVideoDecoder && !pAudioDecoder)
+        dLength = 0.0;
+    LogEx(L"MovieConv::StartThread(): ConvLength[%0.3fs]", dLength);
+    if (pVideoDecoder && !SourceFormat(pVideoDecoder)) {
+        LogEx(L"Failed to open file.\r\n");
+        return kCannotOpenSource;
+    }
+
+    Log(L"MovieConv::Estimate DiskSpace...");
+    const long long estimate = GetEstimateDiskSpace();
+    LogDiskSpace(estimate, GetDiskFreeSpace(strOutputFile.c_str()), strOutputFile.c_str());
+
+    hProgressWnd = window;
+    pfnProgress = callback;
+    pProgressContext = context;
+    LogEx(L"Encoding thread Starting .");
+    BaseThread::Start();
+    return 0;
+}
+
+int ConvThread::svc() {
+    if (!pVideoDecoder && !pAudioDecoder) {
+        LogEx(L"MovieConv::decoder is null");
+        if (pfnProgress)
+            pfnProgress(pProgressContext, 1, kOutcomeFailed, 0);
+    } else if (encodeParam.bNoVideo || IsEmpty(pVideoDecoder)) {
+        DropVideo();
+        process_audio_only();
+    } else if (encodeParam.bNoAudio || IsEmpty(pAudioDecoder)) {
+        DropAudio();
+        process_video_only();
+    } else {
+        process();
+    }
+    LogEx(L"Encoding thread Exit.");
+    return 0;
+}
+
+void ConvThread::DropVideo() {
+    const bool empty = IsEmpty(pVideoDecoder);
+    const CSingleLock guard(&sharedLock);
+    if (empty)
+        pVideoDecoder = nullptr;
+    encodeParam.bNoVideo = 1;
+}
+
+void ConvThread::DropAudio() {
+    const bool empty = IsEmpty(pAudioDecoder);
+    const CSingleLock guard(&sharedLock);
+    if (empty)
+        pAudioDecoder = nullptr;
+    encodeParam.bNoAudio = 1;
+}
+
+unsigned ConvThread::EnablePreview(unsigned enable) {
+    return bPreview = enable;
+}
+
+int ConvThread::Pause() {
+    if (!IsActive())
+        return nPauseCount;
+    const int count = ++nPauseCount;
+    SettleState();
+    // A stop asked for meanwhile may have released the pauses already; the worker must not sleep through it.
+    if (hStopEvent && hStopEvent->Wait(0) == kWaitSignalled) {
+        ReleasePauses();
+        return 0;
+    }
+    return count;
+}
+
+int ConvThread::Resume() {
+    if (!IsActive())
+        return nPauseCount;
+    int32_t count = nPauseCount;
+    while (count > 0 && !nPauseCount.compare_exchange_weak(count, count - 1)) {
+    }
+    SettleState();
+    return std::max(count - 1, 0);
+}
+
+int ConvThread::Stop(unsigned, unsigned) {
+    const CSingleLock guard(&lock);
+    BaseThread::Abort();
+    BaseThread::Wait(kWaitInfinite);
+    return 0;
+}
+
+int ConvThread::Abort(unsigned, unsigned) {
+    return BaseThread::Abort();
+}

@@ -1,0 +1,214 @@
+#include "tests/recorder/RecordingWriter.h"
+
+#include "media/MediaWriter.h"
+
+#include <condition_variable>
+#include <cstdio>
+#include <mutex>
+
+namespace {
+
+struct State {
+    std::vector<std::string> trace;
+    std::vector<recorder::Written<AudioFrame>> sounds;
+    std::vector<recorder::Written<VideoImage>> pictures;
+    std::vector<EncodeParam> params;
+    std::set<int> failing;
+    const FileFormatInfo* formats = nullptr;
+    std::function<void()> onClose;
+    bool blocking = false;
+    bool blocked = false;
+};
+
+std::mutex g_mutex;
+std::condition_variable g_changed;
+State g_state;
+
+uint32_t Digest(uint32_t digest, const unsigned char* data, int32_t length) {
+    for (int32_t i = 0; i < length; ++i)
+        digest = (digest ^ data[i]) * 16777619; // FNV-1a
+    return digest;
+}
+
+uint32_t DigestPlane(uint32_t digest, const unsigned char* plane, int32_t pitch, int32_t width,
+                     int32_t height) {
+    for (int32_t y = 0; plane && y < height; ++y)
+        digest = Digest(digest, plane + static_cast<ptrdiff_t>(y) * pitch, width);
+    return digest;
+}
+
+constexpr uint32_t kDigestStart = 2166136261;
+
+uint32_t Digest(const AudioFrame& frame) {
+    return Digest(kDigestStart, frame.pData, frame.pData ? frame.nLength : 0);
+}
+
+uint32_t Digest(const VideoImage& image) {
+    const int32_t halfWidth = (image.nWidth + 1) / 2;
+    const int32_t halfHeight = (image.nHeight + 1) / 2;
+    uint32_t digest = DigestPlane(kDigestStart, image.pY, image.nPitchY, image.nWidth, image.nHeight);
+    digest = DigestPlane(digest, image.pU, image.nPitchU, halfWidth, halfHeight);
+    return DigestPlane(digest, image.pV, image.nPitchV, halfWidth, halfHeight);
+}
+
+std::string Utf8(const wchar_t* text) {
+    std::string bytes;
+    for (; *text; ++text) {
+        const auto c = static_cast<uint32_t>(*text);
+        if (c < 0x80) {
+            bytes += static_cast<char>(c);
+            continue;
+        }
+        char escaped[16];
+        snprintf(escaped, sizeof escaped, "\\u{%X}", c);
+        bytes += escaped;
+    }
+    return bytes;
+}
+
+template <class... Values>
+std::string Format(const char* format, Values... values) {
+    char text[256];
+    snprintf(text, sizeof text, format, values...);
+    return text;
+}
+
+// A handle is the address of one of these, so that a file is known by its number.
+struct File {
+    int number;
+};
+
+int Number(const void* file) {
+    return file ? static_cast<const File*>(file)->number : 0;
+}
+
+void WaitWhileBlocking(std::unique_lock<std::mutex>& guard) {
+    if (!g_state.blocking)
+        return;
+    g_state.blocked = true;
+    g_changed.notify_all();
+    g_changed.wait(guard, [] { return !g_state.blocking; });
+    g_state.blocked = false;
+}
+
+} // namespace
+
+namespace recorder {
+
+void Reset() {
+    const std::lock_guard guard(g_mutex);
+    g_state = State();
+    g_changed.notify_all();
+}
+
+void Note(std::string_view line) {
+    const std::lock_guard guard(g_mutex);
+    g_state.trace.emplace_back(line);
+}
+
+std::vector<std::string> Trace() {
+    const std::lock_guard guard(g_mutex);
+    return g_state.trace;
+}
+
+std::vector<Written<AudioFrame>> Sounds() {
+    const std::lock_guard guard(g_mutex);
+    return g_state.sounds;
+}
+
+std::vector<Written<VideoImage>> Pictures() {
+    const std::lock_guard guard(g_mutex);
+    return g_state.pictures;
+}
+
+std::vector<EncodeParam> Params() {
+    const std::lock_guard guard(g_mutex);
+    return g_state.params;
+}
+
+void FailCreates(std::set<int> numbers) {
+    const std::lock_guard guard(g_mutex);
+    g_state.failing = std::move(numbers);
+}
+
+void SetFormatTable(const FileFormatInfo* table) {
+    const std::lock_guard guard(g_mutex);
+    g_state.formats = table;
+}
+
+void OnClose(std::function<void()> hook) {
+    const std::lock_guard guard(g_mutex);
+    g_state.onClose = std::move(hook);
+}
+
+void Block() {
+    const std::lock_guard guard(g_mutex);
+    g_state.blocking = true;
+}
+
+void Unblock() {
+    const std::lock_guard guard(g_mutex);
+    g_state.blocking = false;
+    g_changed.notify_all();
+}
+
+void WaitUntilBlocked() {
+    std::unique_lock guard(g_mutex);
+    g_changed.wait(guard, [] { return g_state.blocked; });
+}
+
+} // namespace recorder
+
+const FileFormatInfo* MWGetFileFormatInfos() {
+    const std::lock_guard guard(g_mutex);
+    return g_state.formats;
+}
+
+void* MWCreateMediaFile(const wchar_t* fileName, const EncodeParam* param, const VideoFormat* video,
+                        const AudioFormat* audio) {
+    const std::lock_guard guard(g_mutex);
+    g_state.params.push_back(*param);
+    const int number = static_cast<int>(g_state.params.size());
+    std::string line = "create " + Utf8(fileName);
+    line += video ? Format(" %dx%d@%g", video->nWidth, video->nHeight, video->dFrameRate) : " -";
+    line += audio ? Format(" %d/%d", audio->nSampleRate, audio->nChannels) : " -";
+    const bool fails = g_state.failing.count(number) > 0;
+    g_state.trace.push_back(line + (fails ? " -> null" : Format(" -> #%d", number)));
+    return fails ? nullptr : new File{number};
+}
+
+int MWWriteVideoFrame(void* file, const VideoImage* image) {
+    std::unique_lock guard(g_mutex);
+    WaitWhileBlocking(guard);
+    g_state.pictures.push_back({Number(file), *image, Digest(*image)});
+    g_state.trace.push_back(Format("picture #%d %lld", Number(file), static_cast<long long>(image->llTime)));
+    return file != nullptr;
+}
+
+int MWWriteAudioData(void* file, const AudioFrame* frame) {
+    std::unique_lock guard(g_mutex);
+    WaitWhileBlocking(guard);
+    g_state.sounds.push_back({Number(file), *frame, Digest(*frame)});
+    g_state.trace.push_back(Format("%s #%d %lld +%d", frame->nType == kMediaTypeSilence ? "silence" : "sound",
+                                   Number(file), static_cast<long long>(frame->llTime), frame->nLength));
+    return file != nullptr;
+}
+
+int MWCloseMediaFile(void* file, ProgressCallback callback, void* context) {
+    std::function<void()> hook;
+    {
+        const std::lock_guard guard(g_mutex);
+        if (callback)
+            hook = g_state.onClose;
+    }
+    if (hook)
+        hook();
+    std::string line = Format("close #%d", Number(file));
+    if (callback)
+        line += context ? " with callback and context" : " with callback";
+    else if (context)
+        line += " with context";
+    recorder::Note(line);
+    delete static_cast<File*>(file);
+    return file != nullptr;
+}
