@@ -135,8 +135,8 @@ OSStatus SetEventParameter(EventRef event, EventParamName name, EventParamType t
     if (!event || (!data && size > 0))
         return paramErr;
     try {
-        const auto* bytes = static_cast<const std::byte*>(data);
-        Parameter parameter{name, type, std::vector<std::byte>(bytes, bytes + size)};
+        Parameter parameter{name, type, std::vector<std::byte>(size)};
+        std::copy_n(static_cast<const std::byte*>(data), size, parameter.data.begin());
         const auto found = event->Find(name);
         if (found != event->parameters.end())
             *found = std::move(parameter);

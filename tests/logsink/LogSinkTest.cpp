@@ -1,0 +1,140 @@
+#include "logsink/LogSink.h"
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <clocale>
+#include <cwchar>
+#include <filesystem>
+#include <fstream>
+#include <iterator>
+#include <set>
+#include <string>
+#include <thread>
+#include <vector>
+
+#include <unistd.h>
+
+namespace {
+
+namespace fs = std::filesystem;
+
+class LogSink : public testing::Test {
+protected:
+    LogSink() : directory(fs::temp_directory_path() / ("logsink-" + std::to_string(getpid()))) {
+        fs::create_directories(directory);
+    }
+    ~LogSink() override {
+        LogSinkSetFile(nullptr);
+        fs::remove_all(directory);
+    }
+
+    std::string Path(const char* name) const { return directory / name; }
+
+    static std::string Content(const std::string& path) {
+        std::ifstream file(path, std::ios::binary);
+        return {std::istreambuf_iterator<char>(file), {}};
+    }
+
+private:
+    fs::path directory;
+};
+
+TEST_F(LogSink, EveryCallIsOneLineOfUtf8) {
+    struct {
+        std::wstring text;
+        std::string line;
+    } const cases[] = {
+        {L"plain", "plain\n"},
+        {L"MovieConv::line.\r\n", "MovieConv::line.\n"},
+        {L"many ends\n\r\r\n\n", "many ends\n"},
+        {L"", "\n"},
+        {L"\r\n", "\n"},
+        {L"two\r\nlines", "two  lines\n"},
+        {L"100%s %d", "100%s %d\n"},
+        {L"\u00e9 \u20ac \U0001F600", "\xC3\xA9 \xE2\x82\xAC \xF0\x9F\x98\x80\n"},
+        {{static_cast<wchar_t>(0xD800), static_cast<wchar_t>(0xDCE9)}, "\xEF\xBF\xBD\xEF\xBF\xBD\n"},
+        {{static_cast<wchar_t>(0x110000), static_cast<wchar_t>(-1)}, "\xEF\xBF\xBD\xEF\xBF\xBD\n"},
+        {std::wstring(5000, L'x'), std::string(5000, 'x') + "\n"},
+    };
+    std::setlocale(LC_ALL, "C");
+    const std::string path = Path("lines");
+    ASSERT_EQ(LogSinkSetFile(path.c_str()), 1);
+    std::string expected;
+    for (const auto& [text, line] : cases) {
+        EXPECT_EQ(Log(text.c_str()), 1);
+        expected += line;
+        EXPECT_EQ(Content(path), expected);
+    }
+    EXPECT_EQ(Log(nullptr), 0);
+    EXPECT_EQ(Content(path), expected);
+}
+
+TEST_F(LogSink, GoesToStandardErrorAtFirstAndAfterNull) {
+    testing::internal::CaptureStderr();
+    EXPECT_EQ(Log(L"first"), 1);
+    ASSERT_EQ(LogSinkSetFile(Path("file").c_str()), 1);
+    EXPECT_EQ(Log(L"second"), 1);
+    ASSERT_EQ(LogSinkSetFile(nullptr), 1);
+    EXPECT_EQ(Log(L"third"), 1);
+    EXPECT_EQ(testing::internal::GetCapturedStderr(), "first\nthird\n");
+    EXPECT_EQ(Content(Path("file")), "second\n");
+}
+
+TEST_F(LogSink, AppendsToAFileThatExists) {
+    const std::string path = Path("old \xC3\xA9");
+    std::ofstream(path) << "old\n";
+    ASSERT_EQ(LogSinkSetFile(path.c_str()), 1);
+    Log(L"new");
+    EXPECT_EQ(Content(path), "old\nnew\n");
+}
+
+TEST_F(LogSink, DiscardsForAnEmptyName) {
+    ASSERT_EQ(LogSinkSetFile(Path("file").c_str()), 1);
+    ASSERT_EQ(LogSinkSetFile(""), 1);
+    testing::internal::CaptureStderr();
+    EXPECT_EQ(Log(L"gone"), 1);
+    EXPECT_EQ(testing::internal::GetCapturedStderr(), "");
+    EXPECT_EQ(Content(Path("file")), "");
+}
+
+TEST_F(LogSink, KeepsTheOldTargetWhenAFileCannotBeOpened) {
+    ASSERT_EQ(LogSinkSetFile(Path("file").c_str()), 1);
+    EXPECT_EQ(LogSinkSetFile(Path("missing/file").c_str()), 0);
+    Log(L"still here");
+    EXPECT_EQ(Content(Path("file")), "still here\n");
+}
+
+TEST_F(LogSink, ReportsALineThatCannotBeWritten) {
+    ASSERT_EQ(LogSinkSetFile("/dev/full"), 1);
+    EXPECT_EQ(Log(L"lost"), 0);
+}
+
+TEST_F(LogSink, KeepsLinesWholeWhileThreadsWriteAndTheTargetChanges) {
+    constexpr int kThreads = 4;
+    constexpr int kLines = 300;
+    ASSERT_EQ(LogSinkSetFile(Path("a").c_str()), 1);
+    std::vector<std::thread> threads;
+    for (int thread = 0; thread < kThreads; ++thread)
+        threads.emplace_back([thread] {
+            for (int line = 0; line < kLines; ++line)
+                Log((std::to_wstring(thread) + L":" + std::to_wstring(line) + L":" + std::wstring(200, L'x'))
+                        .c_str());
+        });
+    for (int change = 0; change < 50; ++change)
+        EXPECT_EQ(LogSinkSetFile(Path(change % 2 == 0 ? "b" : "a").c_str()), 1);
+    for (std::thread& thread : threads)
+        thread.join();
+
+    std::set<std::string> seen;
+    for (const char* name : {"a", "b"}) {
+        std::ifstream file(Path(name));
+        for (std::string line; std::getline(file, line);) {
+            EXPECT_EQ(std::count(line.begin(), line.end(), 'x'), 200);
+            EXPECT_TRUE(seen.insert(line).second);
+        }
+    }
+    EXPECT_EQ(seen.size(), static_cast<std::size_t>(kThreads) * kLines);
+}
+
+} // namespace
