@@ -1,13 +1,19 @@
 #include "thread/BaseThread.h"
 
+#include "thread/SingleLock.h"
+
 #include <cstdio>
 #include <memory>
+#include <new>
+#include <utility>
 
 #include <unistd.h>
 
 pthread_t* _beginthreadex(void* /*security*/, unsigned /*stackSize*/, void* (*start)(void*), void* arg,
                           unsigned /*initFlag*/, unsigned* /*threadId*/) {
-    auto handle = std::make_unique<pthread_t>();
+    std::unique_ptr<pthread_t> handle(new (std::nothrow) pthread_t);
+    if (!handle)
+        return nullptr;
     pthread_attr_t attributes;
     pthread_attr_init(&attributes);
     const int error = pthread_create(handle.get(), &attributes, start, arg);
@@ -25,7 +31,12 @@ unsigned LowAddress(const void* address) {
 } // namespace
 
 BaseThread::BaseThread()
-    : hThread(nullptr), hStopEvent(nullptr), hExitEvent(nullptr), nPauseCount(0), nState(kStateIdle) {
+    : hThread(nullptr),
+      hStopEvent(nullptr),
+      hExitEvent(nullptr),
+      nPauseCount(0),
+      nState(kStateIdle),
+      joinMutex(PTHREAD_MUTEX_INITIALIZER) {
     printf("ThreadEngine::ThreadEngine() [0x%x]...\r\n", LowAddress(this));
     hStopEvent = SyncCreateEvent(nullptr, 1, 1, nullptr);
     hExitEvent = SyncCreateEvent(nullptr, 1, 1, nullptr);
@@ -42,6 +53,7 @@ BaseThread::~BaseThread() {
     SyncCloseEvent(hExitEvent);
     hStopEvent = nullptr;
     hExitEvent = nullptr;
+    pthread_mutex_destroy(&joinMutex);
 }
 
 bool BaseThread::IsActive() const {
@@ -50,8 +62,7 @@ bool BaseThread::IsActive() const {
 }
 
 int BaseThread::Start() {
-    int32_t previousState = nState;
-    if (previousState == kStateRunning || previousState == kStatePaused)
+    if (IsActive())
         return 0;
     Join(); // a worker that ended without anybody waiting for it
     if (hStopEvent)
@@ -61,9 +72,9 @@ int BaseThread::Start() {
 
     // Stored before the thread can run: a body that returns at once must find its "finished" left alone.
     const int32_t previousPauseCount = nPauseCount.exchange(0);
-    nState = kStateRunning;
-    pthread_t* thread = _beginthreadex(nullptr, 0, thread_func, this, 0, nullptr);
-    if (!thread) {
+    const int32_t previousState = nState.exchange(kStateRunning);
+    SettleState(); // another thread may have paused between the two
+    if (!StartThread()) {
         nPauseCount = previousPauseCount;
         nState = previousState;
         if (hStopEvent)
@@ -72,9 +83,15 @@ int BaseThread::Start() {
             hExitEvent->SetEvent();
         return 0;
     }
-    hThread = thread;
     usleep(1000);
     return 1;
+}
+
+bool BaseThread::StartThread() {
+    // Under the lock, so that who waits for a body that returns at once finds the thread to join.
+    CSingleLock lock(&joinMutex);
+    hThread = _beginthreadex(nullptr, 0, thread_func, this, 0, nullptr);
+    return hThread != nullptr;
 }
 
 void* BaseThread::thread_func(void* arg) {
@@ -92,7 +109,7 @@ int BaseThread::svc() {
     for (;;) {
         while (nState == kStatePaused)
             usleep(10000);
-        if (!hStopEvent || hStopEvent->Wait(0) == kWaitSignalled)
+        if (IsStopRequested())
             return 0;
     }
 }
@@ -118,10 +135,15 @@ unsigned BaseThread::Wait(unsigned timeoutMs) {
 }
 
 void BaseThread::Join() {
-    // Whoever takes the handle joins, so the worker is joined once in every order of calls.
-    const std::unique_ptr<pthread_t> thread(hThread.exchange(nullptr));
+    // Whoever comes second waits for the first, so that nobody returns from a wait before the worker is gone.
+    CSingleLock lock(&joinMutex);
+    const std::unique_ptr<pthread_t> thread(std::exchange(hThread, nullptr));
     if (thread)
         pthread_join(*thread, nullptr);
+}
+
+bool BaseThread::IsStopRequested() const {
+    return !hStopEvent || hStopEvent->Wait(0) == kWaitSignalled;
 }
 
 void BaseThread::ReleasePauses() {
@@ -129,13 +151,18 @@ void BaseThread::ReleasePauses() {
     SettleState();
 }
 
+int32_t BaseThread::ActiveState() const {
+    // A pause that comes after a stop request holds nothing up: the worker must get to see the request.
+    return nPauseCount > 0 && !IsStopRequested() ? kStatePaused : kStateRunning;
+}
+
 void BaseThread::SettleState() {
-    // The count decides between running and paused. A count that another thread changes meanwhile is looked at again, and
-    // a worker that has finished keeps its state, since neither exchange expects it.
-    int32_t count;
+    // What another thread changes meanwhile is looked at again, and a worker that has finished keeps its
+    // state, since the exchange does not expect it.
+    int32_t wanted;
     do {
-        count = nPauseCount;
-        int32_t expected = count > 0 ? kStateRunning : kStatePaused;
-        nState.compare_exchange_strong(expected, count > 0 ? kStatePaused : kStateRunning);
-    } while (nPauseCount != count);
+        wanted = ActiveState();
+        int32_t other = wanted == kStatePaused ? kStateRunning : kStatePaused;
+        nState.compare_exchange_strong(other, wanted);
+    } while (ActiveState() != wanted);
 }

@@ -13,9 +13,9 @@ enum ThreadState : int32_t { kStateIdle = 0, kStateRunning = 1, kStatePaused = 2
 
 /// Owns at most one worker thread at a time, which runs `svc`.
 ///
-/// Start and the destructor belong to one thread, the owner's; Abort and Wait may be called from several threads at once;
-/// svc runs on the worker. A derived class must stop its worker in its own destructor: once that has run, the derived
-/// svc is gone.
+/// Start and the destructor belong to one thread, the owner's; Abort and Wait may be called from several
+/// threads at once, Wait not from the worker; svc runs on the worker. A derived class must stop its worker in
+/// its own destructor: once that has run, the derived svc is gone.
 class BaseThread {
 public:
     BaseThread();
@@ -41,28 +41,37 @@ protected:
     /// True while the worker runs or is paused.
     bool IsActive() const;
 
-    /// Brings the state of an active worker in line with the pause count, after any change of the count.
+    /// True once the worker shall end.
+    bool IsStopRequested() const;
+
+    /// Brings the state of an active worker in line with the pause count and the stop request, after any
+    /// change of them.
     void SettleState();
 
     /// Ends every pause.
     void ReleasePauses();
 
-    std::atomic<pthread_t*> hThread;
+    pthread_t* hThread; // guarded by joinMutex
     SyncEvent* hStopEvent;
     SyncEvent* hExitEvent;
     std::atomic<int32_t> nPauseCount;
     std::atomic<int32_t> nState;
 
 private:
+    int32_t ActiveState() const;
+    bool StartThread();
     void Join();
+
+    pthread_mutex_t joinMutex; // held while the thread is made and while it is joined
 };
 
 #pragma GCC visibility push(default)
 
-/// Starts a thread that runs `start(arg)`. The heap-allocated handle is the caller's, who joins the thread and deletes
-/// it; null when no thread could be made. `security`, `stackSize` and `initFlag` are not used, `threadId` not written.
-pthread_t* _beginthreadex(void* security, unsigned stackSize, void* (*start)(void*), void* arg, unsigned initFlag,
-                          unsigned* threadId);
+/// Starts a thread that runs `start(arg)`. The heap-allocated handle is the caller's, who joins the thread
+/// and deletes it; null when no thread could be made. `security`, `stackSize` and `initFlag` are not used,
+/// `threadId` not written.
+pthread_t* _beginthreadex(void* security, unsigned stackSize, void* (*start)(void*), void* arg,
+                          unsigned initFlag, unsigned* threadId);
 
 #pragma GCC visibility pop
 

@@ -7,7 +7,7 @@
 namespace {
 
 uint32_t SystemClock() {
-    struct tms unused; // the kernel wants a place for the process times
+    struct tms unused;                                 // the kernel wants a place for the process times
     return static_cast<uint32_t>(times(&unused)) * 10; // the kernel counts 100 ticks a second
 }
 
@@ -15,6 +15,10 @@ std::atomic<uint32_t (*)()> g_source{SystemClock};
 
 } // namespace
 
-uint32_t MillisecondClock() { return g_source.load(std::memory_order_relaxed)(); }
+uint32_t MillisecondClock() {
+    return g_source.load(std::memory_order_relaxed)();
+}
 
-void SetMillisecondClock(uint32_t (*source)()) { g_source = source ? source : SystemClock; }
+void SetMillisecondClock(uint32_t (*source)()) {
+    g_source = source ? source : SystemClock;
+}

@@ -8,7 +8,9 @@
 SyncEvent::SyncEvent(bool manualReset, int32_t initialState)
     : mutex(PTHREAD_MUTEX_INITIALIZER), bSignalled(initialState), bManualReset(manualReset) {}
 
-SyncEvent::~SyncEvent() { pthread_mutex_destroy(&mutex); }
+SyncEvent::~SyncEvent() {
+    pthread_mutex_destroy(&mutex);
+}
 
 void SyncEvent::SetEvent() {
     CSingleLock lock(&mutex);
@@ -41,4 +43,6 @@ SyncEvent* SyncCreateEvent(void* /*attributes*/, unsigned manualReset, unsigned 
     return new SyncEvent(manualReset != 0, static_cast<int32_t>(initialState));
 }
 
-void SyncCloseEvent(SyncEvent* event) { delete event; }
+void SyncCloseEvent(SyncEvent* event) {
+    delete event;
+}

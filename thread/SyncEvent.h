@@ -7,8 +7,8 @@
 
 #include <pthread.h>
 
-constexpr unsigned kWaitSignalled = 0;        ///< The awaited thing happened.
-constexpr unsigned kWaitTimeout = 258;        ///< The time ran out.
+constexpr unsigned kWaitSignalled = 0;         ///< The awaited thing happened.
+constexpr unsigned kWaitTimeout = 258;         ///< The time ran out.
 constexpr unsigned kWaitInfinite = 0xFFFFFFFF; ///< Wait without a limit.
 
 class SyncEvent {
@@ -21,8 +21,8 @@ public:
     void SetEvent();
     void ResetEvent();
 
-    /// Waits until the event is set, looking every 10 ms, for at most `timeoutMs` milliseconds. kWaitSignalled or
-    /// kWaitTimeout. An event made without manual reset is reset by a successful wait.
+    /// Waits until the event is set, looking every 10 ms, for at most `timeoutMs` milliseconds.
+    /// kWaitSignalled or kWaitTimeout. An event made without manual reset is reset by a successful wait.
     unsigned Wait(unsigned timeoutMs);
 
 private:
@@ -33,7 +33,8 @@ private:
 
 #pragma GCC visibility push(default)
 
-/// A new event on the heap, owned by the caller, to be given to SyncCloseEvent. `attributes` and `name` are not used.
+/// A new event on the heap, owned by the caller, to be given to SyncCloseEvent. `attributes` and `name` are
+/// not used.
 SyncEvent* SyncCreateEvent(void* attributes, unsigned manualReset, unsigned initialState, const char* name);
 
 /// Frees an event. Null does nothing.

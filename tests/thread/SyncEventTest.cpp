@@ -1,0 +1,123 @@
+#include "thread/SyncEvent.h"
+
+#include "thread/Clock.h"
+#include "thread/SingleLock.h"
+
+#include <gtest/gtest.h>
+
+#include <atomic>
+#include <cstdint>
+#include <memory>
+#include <thread>
+#include <vector>
+
+namespace {
+
+struct CloseEvent {
+    void operator()(SyncEvent* event) const { SyncCloseEvent(event); }
+};
+using EventPointer = std::unique_ptr<SyncEvent, CloseEvent>;
+
+EventPointer NewEvent(unsigned manualReset, unsigned initialState) {
+    return EventPointer(SyncCreateEvent(nullptr, manualReset, initialState, nullptr));
+}
+
+std::atomic<uint32_t> g_now;
+std::atomic<uint32_t> g_readings;
+
+/// Every reading of the clock finds that 10 ms have gone by.
+uint32_t SteppingClock() {
+    ++g_readings;
+    return g_now.fetch_add(10);
+}
+
+class SyncEventTest : public testing::Test {
+protected:
+    ~SyncEventTest() override { SetMillisecondClock(nullptr); }
+
+    static void UseSteppingClock(uint32_t start) {
+        g_now = start;
+        g_readings = 0;
+        SetMillisecondClock(SteppingClock);
+    }
+};
+
+TEST_F(SyncEventTest, InitialAndManualStates) {
+    struct {
+        unsigned manualReset, initialState;
+        unsigned first, second;
+    } const cases[] = {
+        {1, 0, kWaitTimeout, kWaitTimeout},     {1, 1, kWaitSignalled, kWaitSignalled},
+        {1, 5, kWaitSignalled, kWaitSignalled}, {7, 1, kWaitSignalled, kWaitSignalled},
+        {0, 0, kWaitTimeout, kWaitTimeout},     {0, 1, kWaitSignalled, kWaitTimeout},
+    };
+    for (const auto& row : cases) {
+        const EventPointer event = NewEvent(row.manualReset, row.initialState);
+        EXPECT_EQ(event->Wait(0), row.first) << row.manualReset << row.initialState;
+        EXPECT_EQ(event->Wait(0), row.second) << row.manualReset << row.initialState;
+    }
+}
+
+TEST_F(SyncEventTest, SetAndReset) {
+    const EventPointer manual = NewEvent(1, 0);
+    manual->SetEvent();
+    EXPECT_EQ(manual->Wait(0), kWaitSignalled);
+    manual->ResetEvent();
+    EXPECT_EQ(manual->Wait(0), kWaitTimeout);
+
+    const EventPointer automatic = NewEvent(0, 0);
+    automatic->SetEvent();
+    automatic->SetEvent(); // set is set: the second adds nothing
+    EXPECT_EQ(automatic->Wait(kWaitInfinite), kWaitSignalled);
+    EXPECT_EQ(automatic->Wait(0), kWaitTimeout);
+}
+
+TEST_F(SyncEventTest, ZeroTimeoutNeverLooksAtTheClock) {
+    UseSteppingClock(0);
+    EXPECT_EQ(NewEvent(1, 0)->Wait(0), kWaitTimeout);
+    EXPECT_EQ(g_readings, 0U);
+}
+
+TEST_F(SyncEventTest, TimesOutOnceTheTimeHasGoneBy) {
+    // The start is one reading; then one reading a look, each 10 ms later than the one before.
+    for (const uint32_t start : {0U, 1000U, 0xFFFFFFF0U, 0x7FFFFFF6U}) {
+        for (const uint32_t timeout : {1U, 10U, 50U, 55U}) {
+            UseSteppingClock(start);
+            EXPECT_EQ(NewEvent(1, 0)->Wait(timeout), kWaitTimeout);
+            EXPECT_EQ(g_readings, 1 + (timeout + 9) / 10) << start << " " << timeout;
+        }
+    }
+}
+
+TEST_F(SyncEventTest, WaitsUntilAnotherThreadSets) {
+    for (const unsigned timeout : {kWaitInfinite, 60000U}) {
+        const EventPointer event = NewEvent(1, 0);
+        std::thread setter([&event] { event->SetEvent(); });
+        EXPECT_EQ(event->Wait(timeout), kWaitSignalled);
+        setter.join();
+    }
+}
+
+TEST_F(SyncEventTest, CloseAcceptsNull) {
+    SyncCloseEvent(nullptr);
+}
+
+TEST(SingleLock, ExcludesOtherThreads) {
+    pthread_mutex_t mutex = PTHREAD_MUTEX_INITIALIZER;
+    int count = 0; // plain on purpose
+    std::vector<std::thread> threads;
+    for (int i = 0; i < 4; ++i)
+        threads.emplace_back([&] {
+            for (int round = 0; round < 5000; ++round) {
+                CSingleLock lock(&mutex);
+                ++count;
+            }
+        });
+    for (std::thread& thread : threads)
+        thread.join();
+    EXPECT_EQ(count, 20000);
+    EXPECT_EQ(pthread_mutex_trylock(&mutex), 0);
+    pthread_mutex_unlock(&mutex);
+}
+
+} // namespace

@@ -1,0 +1,57 @@
+#include "thread/TimeData.h"
+
+#include "thread/Clock.h"
+
+#include <gtest/gtest.h>
+
+#include <cstdint>
+
+#include <unistd.h>
+
+namespace {
+
+TEST(TimeData, Table) {
+    struct {
+        unsigned long ms;
+        TimeData time;
+    } const cases[] = {
+        {0, {0, 0, 0, 0}},
+        {999, {0, 0, 0, 999}},
+        {59999, {0, 0, 59, 999}},
+        {60000, {0, 1, 0, 0}},
+        {3599999, {0, 59, 59, 999}},
+        {3600000, {1, 0, 0, 0}},
+        {3723456, {1, 2, 3, 456}},
+        {86399999, {23, 59, 59, 999}},
+        {90000000, {25, 0, 0, 0}},
+        {0xFFFFFFFF, {1193, 2, 47, 295}},
+        {static_cast<unsigned long>(-1000), {1193, 2, 46, 296}},
+    };
+    for (const auto& [ms, time] : cases) {
+        const TimeData got = GetTimeData(ms);
+        EXPECT_EQ(got.nHours, time.nHours) << ms;
+        EXPECT_EQ(got.nMinutes, time.nMinutes) << ms;
+        EXPECT_EQ(got.nSeconds, time.nSeconds) << ms;
+        EXPECT_EQ(got.nMilliseconds, time.nMilliseconds) << ms;
+    }
+}
+
+TEST(Clock, GoesOnInStepsOfTenMilliseconds) {
+    const uint32_t start = MillisecondClock();
+    uint32_t now = start;
+    while (now == start) {
+        usleep(1000);
+        now = MillisecondClock();
+    }
+    EXPECT_LT(now - start, 0x80000000U);
+    EXPECT_EQ((now - start) % 10, 0U);
+}
+
+TEST(Clock, CanBeSetAndRestored) {
+    SetMillisecondClock([]() -> uint32_t { return 1234; });
+    EXPECT_EQ(MillisecondClock(), 1234U);
+    SetMillisecondClock(nullptr);
+    EXPECT_NE(MillisecondClock(), 1234U);
+}
+
+} // namespace
