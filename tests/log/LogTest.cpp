@@ -1,0 +1,256 @@
+#include "log/dyLog.h"
+
+#include "tests/log/ScriptedBundle.h"
+
+#include <gtest/gtest.h>
+
+#include <cstdint>
+#include <cstdlib>
+#include <filesystem>
+#include <functional>
+#include <regex>
+#include <string>
+#include <thread>
+#include <vector>
+
+#include <sys/wait.h>
+#include <unistd.h>
+
+// What a search of the whole process would find; the log module must never call it.
+extern "C" [[gnu::visibility("default")]] int GlobalLog(const wchar_t*) __asm__("Log");
+extern "C" int GlobalLog(const wchar_t* /*text*/) {
+    std::abort();
+}
+
+namespace {
+
+namespace fs = std::filesystem;
+
+/// Runs `body` in a process of its own, where nothing has been logged yet, and gives back what that printed.
+/// Failed expectations in the body count here.
+std::string PrintedBy(const std::function<void()>& body) {
+    testing::internal::CaptureStdout();
+    const pid_t child = fork();
+    if (child == 0) {
+        body();
+        std::fflush(nullptr);
+        _exit(testing::Test::HasFailure() ? 1 : 0);
+    }
+    int status = -1;
+    waitpid(child, &status, 0);
+    std::string printed = testing::internal::GetCapturedStdout();
+    EXPECT_EQ(status, 0) << printed;
+    return printed;
+}
+
+class Logging : public testing::Test {
+protected:
+    Logging() : directory(fs::temp_directory_path() / ("dylog " + std::to_string(getpid()))) {
+        fs::create_directories(directory);
+        g_bundle = {"file://localhost" + std::regex_replace(directory.native(), std::regex(" "), "%20") +
+                    "/"};
+    }
+    ~Logging() override {
+        EXPECT_EQ(g_bundle.urlsOut, 0);
+        fs::remove_all(directory);
+    }
+
+    void PutSink(const char* library) const { fs::copy_file(library, SinkPath()); }
+    fs::path SinkPath() const { return directory / "quennet.dylib"; }
+
+    static std::wstring LastLine() {
+        const auto lastLine = reinterpret_cast<const wchar_t* (*)()>(LogGetAddress("LastLine"));
+        return lastLine ? lastLine() : L"no sink";
+    }
+
+    fs::path directory;
+};
+
+TEST(Replace, Table) {
+    struct {
+        const char *text, *pattern;
+        char replacement;
+        const char* expected;
+        int count;
+    } const cases[] = {
+        {"a%20b%20", "%20", ' ', "a b ", 2},
+        {"aaa", "aa", 'X', "Xa", 1},
+        {"aaaa", "aa", 'X', "XX", 2},
+        {"aaaa", "aa", 'a', "aa", 2},
+        {"plain", "%20", ' ', "plain", 0},
+        {"", "%20", ' ', "", 0},
+        {"%2", "%20", ' ', "%2", 0},
+        {"%20", "%20", ' ', " ", 1},
+        {"%220%20%2", "%20", ' ', "%220 %2", 1},
+        {"x/y/z", "/", ':', "x:y:z", 2},
+    };
+    for (const auto& row : cases) {
+        std::string text = row.text;
+        EXPECT_EQ(replace_str_2_char(text.data(), row.pattern, row.replacement), row.count) << row.text;
+        EXPECT_STREQ(text.c_str(), row.expected);
+    }
+}
+
+TEST_F(Logging, DirectoryTable) {
+    const std::string localhost = "file://localhost";
+    struct {
+        std::string url, path;
+    } const cases[] = {
+        {"file://localhost/Applications/My%20App.app/", "/Applications/My App.app/Contents/MacOS"},
+        {"file://localhost/usr/local/bin/", "/usr/local/bin"},
+        {"file:///Applications/X.app/", "file:///Applications/X.app/Contents/MacOS"},
+        {"file:///usr/bin/", "file:///usr/bin"},
+        {"file://localhost/", ""},
+        {"file://localhost/%20%41%c3/", "/ %41%c3"},
+        {"xyzfile://localhost/bin/", "ost/bin"}, // 16 characters are left out wherever the text was found
+        {"file://localhost/.app/", "/.app/Contents/MacOS"},
+        {".app/", ".app/Contents/MacOS"},
+        {"app/", "app"},
+        {"a", ""},
+        {"", ""},
+        {localhost + "/" + std::string(492, 'd') + "/", "/" + std::string(492, 'd')},
+        {localhost + "/" + std::string(493, 'd') + "/", ""}, // 511 bytes: too long for the URL's buffer
+        {localhost + "/" + std::string(476, 'd') + ".app/",
+         "/" + std::string(476, 'd') + ".app/Contents/MacOS"},
+        {std::string(491, 'd') + ".app/", std::string(491, 'd') + ".app/Contents/MacOS"},
+        {std::string(492, 'd') + ".app/", ""},
+        {std::string(505, 'd') + ".app/", ""},
+    };
+    for (const auto& [url, path] : cases) {
+        g_bundle.url = url;
+        std::string buffer(512, '#');
+        GetAppPathA(buffer.data(), 511);
+        EXPECT_EQ(buffer.c_str(), path) << url;
+        EXPECT_EQ(buffer[511], '#');
+    }
+}
+
+TEST_F(Logging, DirectoryIsNeverWrittenPastItsBuffer) {
+    g_bundle.url = "file://localhost/bin/x.app/";
+    const std::string whole = "/bin/x.app/Contents/MacOS";
+    for (int size = -1; size <= static_cast<int>(whole.size()) + 1; ++size) {
+        std::string buffer(64, '#');
+        GetAppPathA(buffer.data(), size);
+        const auto written = static_cast<std::size_t>(size > 0 ? size : 0);
+        EXPECT_EQ(buffer.substr(written), std::string(64 - written, '#'));
+        if (size > 0) {
+            EXPECT_EQ(buffer.c_str(), size > static_cast<int>(whole.size()) ? whole : "") << size;
+        }
+    }
+}
+
+TEST_F(Logging, DirectoryIsEmptyWithoutABundle) {
+    for (const Missing missing : {Missing::Bundle, Missing::Url, Missing::String}) {
+        g_bundle.missing = missing;
+        char buffer[32] = "before";
+        GetAppPathA(buffer, sizeof buffer);
+        EXPECT_STREQ(buffer, "");
+    }
+}
+
+TEST_F(Logging, LinesReachTheSink) {
+    PutSink(recording_sink);
+    const std::string printed = PrintedBy([] {
+        EXPECT_EQ(LogEx(L"MovieConv::%d %ls %f %s\r\n", 5, L"wide \u20ac", 1.5, "narrow"), 1);
+        EXPECT_EQ(LastLine(), L"MovieConv::5 wide \u20ac 1.500000 narrow\r\n");
+        EXPECT_EQ(Log(L"100%s %d"), 2);
+        EXPECT_EQ(LastLine(), L"100%s %d");
+        EXPECT_EQ(LogEx(L""), 0);
+        EXPECT_EQ(LogEx(L"%ls", L""), 0);
+        EXPECT_EQ(LastLine(), L"100%s %d");
+        EXPECT_EQ(Log(L""), 3);
+        EXPECT_EQ(LastLine(), L"");
+        EXPECT_NE(dyLogInit(), nullptr);
+        EXPECT_EQ(dyLogInit(), dyLogInit());
+    });
+    EXPECT_EQ(printed, "");
+}
+
+TEST_F(Logging, LongLinesReachTheSinkCut) {
+    PutSink(recording_sink);
+    PrintedBy([] {
+        const std::wstring fits(1023, L'x');
+        EXPECT_EQ(LogEx(L"%ls", fits.c_str()), 1);
+        EXPECT_EQ(LastLine(), fits);
+        EXPECT_EQ(LogEx(L"%lsy", fits.c_str()), 2);
+        EXPECT_EQ(LastLine().substr(0, 1022), fits.substr(0, 1022));
+        EXPECT_LE(LastLine().size(), 1023U);
+        EXPECT_EQ(LogEx(L"%100000d", 1), 3);
+        EXPECT_LE(LastLine().size(), 1023U);
+    });
+}
+
+TEST_F(Logging, WithoutASinkOnlyTheFirstLineTellsThePath) {
+    const std::string printed = PrintedBy([] {
+        EXPECT_EQ(LogEx(L"%d", 1), 0);
+        EXPECT_EQ(Log(L"two"), 0);
+        EXPECT_EQ(dyLogInit(), nullptr);
+    });
+    const std::string lookup = "dyLog.h: LogGetAddress [Log] [0x0] error.\r\n";
+    EXPECT_EQ(printed, "dyLog.h: dlopen [" + SinkPath().native() + "] error.\r\n" + lookup + lookup);
+}
+
+TEST_F(Logging, AFailedLoadIsNotTriedAgain) {
+    PrintedBy([this] {
+        EXPECT_EQ(dyLogInit(), nullptr);
+        PutSink(recording_sink);
+        EXPECT_EQ(dyLogInit(), nullptr);
+        EXPECT_EQ(Log(L"late"), 0);
+    });
+}
+
+TEST_F(Logging, ALibraryWithoutTheEntryIsToldByItsHandle) {
+    PutSink(entryless_sink);
+    const std::string printed = PrintedBy([] {
+        EXPECT_NE(dyLogInit(), nullptr);
+        EXPECT_NE(LogGetAddress("NotALog"), nullptr);
+        EXPECT_EQ(LogEx(L"line"), 0);
+        std::printf("%x", static_cast<unsigned>(reinterpret_cast<std::uintptr_t>(dyLogInit())));
+    });
+    const std::string start = "dyLog.h: LogGetAddress [Log] [0x";
+    ASSERT_EQ(printed.rfind(start, 0), 0U) << printed;
+    const std::string shown = printed.substr(printed.rfind('\n') + 1);
+    EXPECT_EQ(printed, start + shown + "] error.\r\n" + shown);
+    EXPECT_NE(shown, "0");
+}
+
+TEST_F(Logging, SmallOrdinalsAreShownAsNumbers) {
+    const std::string printed = PrintedBy([] {
+        dyLogInit();
+        for (const std::intptr_t ordinal : {1, 65535})
+            EXPECT_EQ(LogGetAddress(reinterpret_cast<const char*>(ordinal)), nullptr);
+    });
+    EXPECT_EQ(printed.substr(printed.find('\n') + 1), "dyLog.h: LogGetAddress [1] [0x0] error.\r\n"
+                                                      "dyLog.h: LogGetAddress [65535] [0x0] error.\r\n");
+}
+
+TEST_F(Logging, APathThatDoesNotFitGivesUp) {
+    for (const std::string& url :
+         {"file://localhost/" + std::string(600, 'd') + "/", std::string(484, 'd') + "/tail.app/",
+          std::string(498, 'd') + "/", std::string(509, 'd') + "/"}) {
+        g_bundle.url = url;
+        const std::string printed = PrintedBy([] { EXPECT_EQ(dyLogInit(), nullptr); });
+        EXPECT_EQ(printed.rfind("dyLog.h: dlopen [", 0), 0U) << printed;
+        EXPECT_LE(printed.size(), std::string("dyLog.h: dlopen [] error.\r\n").size() + 511);
+    }
+}
+
+TEST_F(Logging, TwoThreadsMayLogFirst) {
+    PutSink(recording_sink);
+    for (int round = 0; round < 10; ++round) {
+        const std::string printed = PrintedBy([] {
+            std::vector<std::thread> threads;
+            for (int i = 0; i < 2; ++i)
+                threads.emplace_back([] {
+                    for (int line = 0; line < 50; ++line)
+                        EXPECT_GT(reinterpret_cast<std::uintptr_t>(LogGetAddress("Log")), 0U);
+                });
+            for (std::thread& thread : threads)
+                thread.join();
+            EXPECT_EQ(Log(L"whole"), 1);
+        });
+        EXPECT_EQ(printed, "");
+    }
+}
+
+} // namespace
