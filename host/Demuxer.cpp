@@ -1,0 +1,210 @@
+#include "host/Demuxer.h"
+
+#include "host/MediaTime.h"
+
+#include <algorithm>
+#include <cstdlib>
+
+namespace host {
+namespace {
+
+constexpr std::size_t kEnoughPackets = 32;
+constexpr std::size_t kEnoughBytes = 16 << 20;
+constexpr int kToleratedFailures = 100;             // reads in a row that may fail on damaged data
+constexpr int64_t kLargestStep = 10 * kMediaSecond; // between packets of one stream; more is a new clock
+constexpr double kPreroll = 0.2;                    // codecs need a little before the first good sample
+constexpr int kProbedPackets = 2000;                // read to find the picture where decoding can begin
+
+} // namespace
+
+Demuxer::Demuxer(Source& source) : source_(source) {
+    if (const AVStream* pictures = source.PictureStream()) {
+        queues_[pictures->index];
+    }
+    if (const AVStream* sound = source.SoundStream()) {
+        queues_[sound->index];
+    }
+}
+
+Demuxer::~Demuxer() {
+    Stop();
+    if (thread_.joinable()) {
+        thread_.join();
+    }
+}
+
+bool Demuxer::Seek(double seconds) {
+    const std::lock_guard lock(mutex_);
+    if (started_ || seconds == soughtSeconds_) {
+        return soughtWell_ && seconds == soughtSeconds_;
+    }
+    soughtSeconds_ = seconds;
+    soughtWell_ = false;
+    AVFormatContext* context = source_.Context();
+    const int64_t start = context->start_time != AV_NOPTS_VALUE ? context->start_time : 0;
+    // Containers seek by decoding order or land beside a key picture, so go back until one lies before the
+    // target.
+    for (double back = kPreroll; !soughtWell_; back = 2 * back + 1) {
+        const bool fromStart = back >= seconds;
+        const int64_t target = start + (fromStart ? 0 : std::llround((seconds - back) * AV_TIME_BASE));
+        if (avformat_seek_file(context, -1, INT64_MIN, target, target, 0) < 0) {
+            break;
+        }
+        soughtWell_ = fromStart || KeyPictureAtOrBefore(ToMediaTime(seconds));
+        if (soughtWell_ && avformat_seek_file(context, -1, INT64_MIN, target, target, 0) < 0) {
+            soughtWell_ = false;
+            break;
+        }
+    }
+    return soughtWell_;
+}
+
+/// Whether the first key picture from here on is shown at `mediaTime` or earlier. True without a picture
+/// stream.
+bool Demuxer::KeyPictureAtOrBefore(int64_t mediaTime) {
+    const AVStream* pictures = source_.PictureStream();
+    if (pictures == nullptr) {
+        return true;
+    }
+    const av::Packet packet(av_packet_alloc());
+    for (int i = 0; i < kProbedPackets && av_read_frame(source_.Context(), packet.get()) >= 0; ++i) {
+        const bool isKey = packet->stream_index == pictures->index && (packet->flags & AV_PKT_FLAG_KEY) != 0;
+        const int64_t stamp = packet->pts != AV_NOPTS_VALUE ? packet->pts : packet->dts;
+        av_packet_unref(packet.get());
+        if (isKey) {
+            return stamp == AV_NOPTS_VALUE || source_.MediaTime(stamp, pictures) <= mediaTime;
+        }
+    }
+    return false;
+}
+
+void Demuxer::Start() {
+    if (!started_ && !stopping_) {
+        started_ = true;
+        thread_ = std::thread(&Demuxer::Run, this);
+    }
+}
+
+av::Packet Demuxer::Take(int stream) {
+    std::unique_lock lock(mutex_);
+    Start();
+    Queue& queue = queues_.at(stream);
+    changed_.wait(lock, [&] { return stopping_ || ended_ || !queue.packets.empty(); });
+    if (stopping_ || queue.packets.empty()) {
+        return nullptr;
+    }
+    av::Packet packet = std::move(queue.packets.front());
+    queue.packets.pop_front();
+    queue.bytes -= static_cast<std::size_t>(packet->size);
+    lock.unlock();
+    changed_.notify_all();
+    return packet;
+}
+
+void Demuxer::Stop() {
+    source_.Interrupt();
+    {
+        const std::lock_guard lock(mutex_);
+        stopping_ = true;
+    }
+    changed_.notify_all();
+}
+
+std::string Demuxer::ReadError() const {
+    const std::lock_guard lock(mutex_);
+    return readError_;
+}
+
+int Demuxer::ClockJumps() const {
+    const std::lock_guard lock(mutex_);
+    return clockJumps_;
+}
+
+bool Demuxer::HasEnough() const {
+    std::size_t bytes = 0;
+    bool allFilled = true;
+    for (const auto& [stream, queue] : queues_) {
+        if (queue.packets.empty()) {
+            return false;
+        }
+        bytes += queue.bytes;
+        allFilled = allFilled && queue.packets.size() >= kEnoughPackets;
+    }
+    return allFilled || bytes >= kEnoughBytes;
+}
+
+void Demuxer::Run() {
+    for (;;) {
+        {
+            std::unique_lock lock(mutex_);
+            changed_.wait(lock, [&] { return stopping_ || !HasEnough(); });
+            if (stopping_) {
+                break;
+            }
+        }
+        if (!ReadOne()) {
+            break;
+        }
+    }
+    {
+        const std::lock_guard lock(mutex_);
+        ended_ = true;
+    }
+    changed_.notify_all();
+}
+
+/// Reads one packet and queues it. False at the end, or when nothing more can be read.
+bool Demuxer::ReadOne() {
+    av::Packet packet(av_packet_alloc());
+    const int result = packet ? av_read_frame(source_.Context(), packet.get()) : AVERROR(ENOMEM);
+    if (result == AVERROR(EAGAIN) || (result == AVERROR_INVALIDDATA && ++failedReads_ < kToleratedFailures)) {
+        return true;
+    }
+    if (result < 0) {
+        const std::lock_guard lock(mutex_);
+        if (result != AVERROR_EOF && !stopping_) {
+            readError_ = av::ErrorText(result);
+        }
+        return false;
+    }
+    failedReads_ = 0;
+    const auto found = queues_.find(packet->stream_index);
+    if (found == queues_.end()) {
+        return true;
+    }
+    RepairClock(*packet);
+    {
+        const std::lock_guard lock(mutex_);
+        found->second.bytes += static_cast<std::size_t>(packet->size);
+        found->second.packets.push_back(std::move(packet));
+    }
+    changed_.notify_all();
+    return true;
+}
+
+/// Recordings joined end to end start a new clock in the middle. From there on the stamps of all streams are
+/// shifted so that time goes on where it stopped.
+void Demuxer::RepairClock(AVPacket& packet) {
+    if ((source_.Context()->iformat->flags & AVFMT_TS_DISCONT) == 0 || packet.dts == AV_NOPTS_VALUE) {
+        return;
+    }
+    const AVStream* stream = source_.Context()->streams[packet.stream_index];
+    const AVRational mediaBase{1, kMediaSecond};
+    const int64_t stamp = av_rescale_q(packet.dts, stream->time_base, mediaBase);
+    const auto due = due_.find(packet.stream_index);
+    if (due != due_.end() && std::abs(stamp + clockShift_ - due->second) > kLargestStep) {
+        clockShift_ = due->second - stamp;
+        const std::lock_guard lock(mutex_);
+        ++clockJumps_;
+    }
+    const int64_t step =
+        packet.duration > 0 ? av_rescale_q(packet.duration, stream->time_base, mediaBase) : 0;
+    due_[packet.stream_index] = stamp + clockShift_ + step;
+    const int64_t shift = av_rescale_q(clockShift_, mediaBase, stream->time_base);
+    packet.dts += shift;
+    if (packet.pts != AV_NOPTS_VALUE) {
+        packet.pts += shift;
+    }
+}
+
+} // namespace host

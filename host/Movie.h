@@ -1,0 +1,46 @@
+// A source with its decoders: everything of the movie that one conversion needs.
+#ifndef MOVIECONV_HOST_MOVIE_H
+#define MOVIECONV_HOST_MOVIE_H
+
+#include "host/Demuxer.h"
+#include "host/PictureDecoder.h"
+#include "host/SoundDecoder.h"
+#include "host/Source.h"
+
+#include <memory>
+#include <string>
+#include <vector>
+
+namespace host {
+
+class Movie {
+public:
+    /// Opens the movie and its decoders. Throws SourceError.
+    Movie(const std::string& path, SourceChoice choice);
+
+    const SourceInfo& Info() const { return source_.Info(); }
+
+    /// Null when the movie has no such stream or it was not asked for.
+    VideoDecoder* Pictures() { return pictures_.get(); }
+    AudioDecoder* Sound() { return sound_.get(); }
+
+    /// Ends both streams at once, so that nobody waits for a slow source. Any thread.
+    void Stop();
+
+    /// Seconds of sound handed out since the begin time; 0 without sound. Any thread.
+    double SoundSeconds() const { return sound_ ? sound_->SecondsDelivered() : 0; }
+
+    /// What was wrong with the movie and has been put right or skipped, a sentence each. Once both streams
+    /// ended.
+    std::vector<std::string> Complaints() const;
+
+private:
+    Source source_;
+    Demuxer demuxer_;
+    std::unique_ptr<PictureDecoder> pictures_;
+    std::unique_ptr<SoundDecoder> sound_;
+};
+
+} // namespace host
+
+#endif

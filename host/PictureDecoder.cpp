@@ -1,0 +1,189 @@
+#include "host/PictureDecoder.h"
+
+#include "host/MediaTime.h"
+
+#include <algorithm>
+
+namespace host {
+namespace {
+
+constexpr std::size_t kPicturesAhead = 8;
+constexpr std::size_t kBytesAhead = 256 << 20;
+constexpr int kTrialPictures = 40;
+constexpr int kWarmUpPictures = 2 * kPicturesAhead;
+constexpr std::size_t kTrialPackets = 400;
+constexpr unsigned kMostThreads = 16;
+
+std::size_t Bytes(const AVFrame& frame) {
+    return static_cast<std::size_t>(frame.width) * static_cast<std::size_t>(frame.height) * 3 / 2;
+}
+
+} // namespace
+
+PictureDecoder::PictureDecoder(const Source& source, Demuxer& demuxer)
+    : source_(source),
+      demuxer_(demuxer),
+      stream_(source.PictureStream()),
+      decoder_(std::make_unique<StreamDecoder>(*stream_, 1)),
+      converter_(source.Info().pictures->quarterTurns, source.Info().pictures->mirrored),
+      stamps_(ToMediaTime(1 / source.Info().pictures->frameRate)),
+      queue_(kPicturesAhead, kBytesAhead) {
+    const PictureStreamInfo& pictures = *source.Info().pictures;
+    info_.format = {pictures.width, pictures.height, pictures.frameRate, pictures.duration};
+    trial_.emplace();
+}
+
+PictureDecoder::~PictureDecoder() {
+    Stop();
+    demuxer_.Stop();
+    if (thread_.joinable()) {
+        thread_.join();
+    }
+}
+
+double PictureDecoder::Seek(double seconds, int /*mode*/) {
+    if (!thread_.joinable()) {
+        begin_ = ToMediaTime(seconds);
+        demuxer_.Seek(seconds);
+    }
+    return seconds;
+}
+
+VideoImage* PictureDecoder::GetCurrentImage() {
+    if (!ended_ && !current_.frame) {
+        thread_ = std::thread(&PictureDecoder::Run, this);
+        ended_ = !Advance();
+    }
+    return ended_ ? nullptr : &image_;
+}
+
+int PictureDecoder::DecodeNext(int /*mode*/) {
+    ended_ = ended_ || !Advance();
+    return ended_ ? 0 : 1;
+}
+
+/// Makes the next picture the current one; the last one stays when there is none.
+bool PictureDecoder::Advance() {
+    std::optional<Picture> next = queue_.Pop();
+    if (!next) {
+        return false;
+    }
+    current_ = std::move(*next);
+    const AVFrame& frame = *current_.frame;
+    image_ = {};
+    image_.nType = kMediaTypePicture;
+    image_.nFormat = kPictureFormatPlanar420;
+    image_.pY = frame.data[0];
+    image_.pU = frame.data[1];
+    image_.pV = frame.data[2];
+    image_.nWidth = frame.width;
+    image_.nHeight = frame.height;
+    image_.nPitchY = frame.linesize[0];
+    image_.nPitchU = frame.linesize[1];
+    image_.nPitchV = frame.linesize[2];
+    image_.llTime = image_.llTime2 = current_.stamp.time;
+    image_.nDuration = static_cast<int32_t>(std::min<int64_t>(current_.stamp.duration, INT32_MAX));
+    ++delivered_;
+    return true;
+}
+
+void PictureDecoder::Run() {
+    DecodeAll();
+    if (const auto last = stamps_.Finish(); last && held_) {
+        Deliver(*last);
+    }
+    repaired_ = stamps_.Repaired();
+    damaged_ = damagedBefore_ + decoder_->Damaged();
+    queue_.Finish();
+}
+
+void PictureDecoder::DecodeAll() {
+    const auto accept = [this](AVFrame& frame) { return Accept(frame); };
+    while (const av::Packet packet = demuxer_.Take(stream_->index)) {
+        if (!decoder_->Decode(packet.get(), accept)) {
+            return;
+        }
+        damaged_ = damagedBefore_ + decoder_->Damaged();
+        ConsiderMoreThreads(av::Packet(trial_ ? av_packet_clone(packet.get()) : nullptr));
+    }
+    decoder_->Decode(nullptr, accept);
+}
+
+bool PictureDecoder::Accept(AVFrame& frame) {
+    if (skip_ > 0) {
+        --skip_;
+        return true;
+    }
+    ++decoded_;
+    std::optional<int64_t> stamp;
+    if (frame.best_effort_timestamp != AV_NOPTS_VALUE) {
+        stamp = source_.MediaTime(frame.best_effort_timestamp, stream_);
+    }
+    const auto previous = stamps_.Push(stamp);
+    if (previous && !Deliver(*previous)) {
+        held_.reset();
+        return false;
+    }
+    held_.reset(av_frame_alloc());
+    if (!held_) {
+        return false;
+    }
+    av_frame_move_ref(held_.get(), &frame);
+    return true;
+}
+
+/// Hands the held picture on, unless it is over before the conversion begins. False when nobody takes it any
+/// more.
+bool PictureDecoder::Deliver(StampRepair::Stamp stamp) {
+    if (begin_ && stamp.time + stamp.duration <= *begin_) {
+        return true;
+    }
+    if (const int64_t begin = begin_.value_or(0); first_ && (begin_ || stamp.time > begin)) {
+        stamp.duration += stamp.time - begin;
+        stamp.time = begin;
+    }
+    av::Frame picture = converter_.Convert(*held_);
+    if (!picture) {
+        ++damagedBefore_;
+        return true;
+    }
+    first_ = false;
+    if (++pushed_ > kWarmUpPictures && queue_.Size() == 0) {
+        ++starved_;
+    }
+    const std::size_t bytes = Bytes(*picture);
+    return queue_.Push({std::move(picture), stamp}, bytes);
+}
+
+/// One thread decodes at first, which costs the least and is enough for most movies: the encoder is slower.
+/// When the queue keeps running empty, the decoder is the slower one and gets the other processors too.
+void PictureDecoder::ConsiderMoreThreads(av::Packet packet) {
+    if (!trial_) {
+        return;
+    }
+    trial_->push_back(std::move(packet));
+    const int judged = pushed_ - kWarmUpPictures;
+    if (judged < kTrialPictures && trial_->size() < kTrialPackets) {
+        return;
+    }
+    const bool runsEmpty = judged <= 0 || starved_ * 2 > judged;
+    if (runsEmpty && std::thread::hardware_concurrency() > 1) {
+        UseMoreThreads();
+    }
+    trial_.reset();
+}
+
+/// Begins again with more threads and skips the frames that are known, whatever lies between key pictures.
+void PictureDecoder::UseMoreThreads() {
+    threads_ = static_cast<int>(std::min(std::thread::hardware_concurrency(), kMostThreads));
+    damagedBefore_ += decoder_->Damaged();
+    decoder_ = std::make_unique<StreamDecoder>(*stream_, threads_);
+    skip_ = decoded_;
+    for (const av::Packet& packet : *trial_) {
+        if (!packet || !decoder_->Decode(packet.get(), [this](AVFrame& frame) { return Accept(frame); })) {
+            return;
+        }
+    }
+}
+
+} // namespace host

@@ -1,0 +1,268 @@
+#include "host/Source.h"
+
+#include "host/MediaTime.h"
+
+#include <algorithm>
+#include <cmath>
+#include <sys/stat.h>
+
+extern "C" {
+#include <libavutil/display.h>
+#include <libavutil/pixdesc.h>
+}
+
+namespace host {
+namespace {
+
+constexpr double kShortestStream = 0.001; // the engine takes a shorter one for absent
+constexpr double kGuessedDuration = 3600; // for sources that tell nothing at all, such as pipes
+constexpr double kHighestFrameRate = 200; // rates above are artefacts of the container's clock
+constexpr AVRational kFallbackFrameRate{25, 1};
+
+int WasInterrupted(void* flag) {
+    return *static_cast<std::atomic<bool>*>(flag) ? 1 : 0;
+}
+
+bool IsPlausible(AVRational rate) {
+    return rate.num > 0 && rate.den > 0 && av_q2d(rate) <= kHighestFrameRate;
+}
+
+/// The average rate, or the container's nominal one where they agree: the average of a short movie is
+/// inexact.
+AVRational FrameRate(const AVStream* stream) {
+    const AVRational average = stream->avg_frame_rate;
+    const AVRational nominal = stream->r_frame_rate;
+    if (IsPlausible(average) && IsPlausible(nominal)) {
+        const bool agree = std::abs(av_q2d(nominal) / av_q2d(average) - 1) < 0.01;
+        return agree ? nominal : average;
+    }
+    if (IsPlausible(average)) {
+        return average;
+    }
+    return IsPlausible(nominal) ? nominal : kFallbackFrameRate;
+}
+
+double StreamDuration(const AVStream* stream) {
+    return stream->duration > 0 ? static_cast<double>(stream->duration) * av_q2d(stream->time_base) : 0;
+}
+
+/// Reads the turn that brings the stored picture upright from the container's display matrix.
+void ReadOrientation(const AVStream* stream, PictureStreamInfo& info) {
+    const uint8_t* data = av_stream_get_side_data(stream, AV_PKT_DATA_DISPLAYMATRIX, nullptr);
+    if (data == nullptr) {
+        return;
+    }
+    int32_t matrix[9];
+    std::copy_n(data, sizeof matrix, reinterpret_cast<uint8_t*>(matrix));
+    const int64_t determinant =
+        static_cast<int64_t>(matrix[0]) * matrix[4] - static_cast<int64_t>(matrix[1]) * matrix[3];
+    info.mirrored = determinant < 0;
+    if (info.mirrored) {
+        av_display_matrix_flip(matrix, 1, 0);
+    }
+    const double counterClockwise = av_display_rotation_get(matrix);
+    if (!std::isnan(counterClockwise)) {
+        const int turns = static_cast<int>((std::lround(-counterClockwise / 90) % 4 + 4) % 4);
+        // The matrix mirrors last, the converter first: the turn changes its direction.
+        info.quarterTurns = info.mirrored ? (4 - turns) % 4 : turns;
+    }
+}
+
+AVRational PixelAspect(AVFormatContext* context, AVStream* stream, bool turned) {
+    AVRational aspect = av_guess_sample_aspect_ratio(context, stream, nullptr);
+    if (aspect.num <= 0 || aspect.den <= 0) {
+        return {1, 1};
+    }
+    return turned ? av_inv_q(aspect) : aspect;
+}
+
+std::string LayoutName(const AVChannelLayout& layout) {
+    char text[64] = "";
+    av_channel_layout_describe(&layout, text, sizeof text);
+    return text;
+}
+
+} // namespace
+
+Source::Source(const std::string& path, SourceChoice choice) {
+    info_.path = path;
+    Open(path);
+    ChooseStreams(choice);
+    FindDuration();
+}
+
+void Source::Open(const std::string& path) {
+    struct stat status {};
+    if (stat(path.c_str(), &status) == 0 && S_ISREG(status.st_mode)) {
+        info_.bytes = status.st_size;
+    }
+    AVFormatContext* context = avformat_alloc_context();
+    if (context == nullptr) {
+        throw std::bad_alloc();
+    }
+    context->interrupt_callback = {WasInterrupted, &interrupted_};
+    // The prefix keeps a colon in the name from being read as a protocol.
+    const int result = avformat_open_input(&context, ("file:" + path).c_str(), nullptr, nullptr);
+    if (result < 0) {
+        const std::string hint =
+            result == AVERROR_INVALIDDATA
+                ? "it is not a movie, or its index is missing because it was never finished"
+                : av::ErrorText(result);
+        throw SourceError("cannot open \"" + path + "\": " + hint);
+    }
+    input_.reset(context);
+    if (const int found = avformat_find_stream_info(context, nullptr); found < 0) {
+        throw SourceError("cannot read the streams of \"" + path + "\": " + av::ErrorText(found));
+    }
+    if (context->start_time != AV_NOPTS_VALUE) {
+        start_ = av_rescale_q(context->start_time, {1, AV_TIME_BASE}, {1, kMediaSecond});
+    }
+    info_.container =
+        context->iformat->long_name != nullptr ? context->iformat->long_name : context->iformat->name;
+}
+
+void Source::ChooseStreams(SourceChoice choice) {
+    for (unsigned i = 0; i < input_->nb_streams; ++i) {
+        input_->streams[i]->discard = AVDISCARD_ALL;
+    }
+    if (choice.pictures) {
+        const int index = av_find_best_stream(input_.get(), AVMEDIA_TYPE_VIDEO, -1, -1, nullptr, 0);
+        const bool isCover =
+            index >= 0 && (input_->streams[index]->disposition & AV_DISPOSITION_ATTACHED_PIC) != 0;
+        if (index >= 0 && !isCover &&
+            avcodec_find_decoder(input_->streams[index]->codecpar->codec_id) != nullptr) {
+            DescribePictures(index);
+        }
+    }
+    if (choice.sound) {
+        const int index = av_find_best_stream(input_.get(), AVMEDIA_TYPE_AUDIO, -1,
+                                              info_.pictures ? info_.pictures->index : -1, nullptr, 0);
+        if (index >= 0 && avcodec_find_decoder(input_->streams[index]->codecpar->codec_id) != nullptr &&
+            input_->streams[index]->codecpar->sample_rate > 0 &&
+            input_->streams[index]->codecpar->ch_layout.nb_channels > 0) {
+            DescribeSound(index);
+        }
+    }
+    if (!info_.pictures && !info_.sound) {
+        throw SourceError("\"" + info_.path + "\" holds no " +
+                          (choice.pictures && choice.sound ? "pictures and no sound"
+                           : choice.pictures               ? "pictures"
+                                                           : "sound") +
+                          " that can be decoded");
+    }
+}
+
+void Source::DescribePictures(int index) {
+    AVStream* stream = input_->streams[index];
+    const AVCodecParameters* parameters = stream->codecpar;
+    if (parameters->width <= 0 || parameters->height <= 0) {
+        return;
+    }
+    stream->discard = AVDISCARD_DEFAULT;
+    PictureStreamInfo info;
+    info.index = index;
+    info.codec = avcodec_get_name(parameters->codec_id);
+    const char* format = av_get_pix_fmt_name(static_cast<AVPixelFormat>(parameters->format));
+    info.pixelFormat = format != nullptr ? format : "unknown";
+    ReadOrientation(stream, info);
+    const bool turned = info.quarterTurns % 2 != 0;
+    info.width = turned ? parameters->height : parameters->width;
+    info.height = turned ? parameters->width : parameters->height;
+    info.pixelAspect = PixelAspect(input_.get(), stream, turned);
+    info.frameRate = av_q2d(FrameRate(stream));
+    info.duration = StreamDuration(stream);
+    info.interlaced = parameters->field_order > AV_FIELD_PROGRESSIVE;
+    info.colorPrimaries = parameters->color_primaries;
+    info.colorTransfer = parameters->color_trc;
+    info.colorMatrix = parameters->color_space;
+    info_.pictures = info;
+}
+
+void Source::DescribeSound(int index) {
+    AVStream* stream = input_->streams[index];
+    const AVCodecParameters* parameters = stream->codecpar;
+    stream->discard = AVDISCARD_DEFAULT;
+    SoundStreamInfo info;
+    info.index = index;
+    info.codec = avcodec_get_name(parameters->codec_id);
+    info.layout = LayoutName(parameters->ch_layout);
+    info.sampleRate = parameters->sample_rate;
+    info.channels = parameters->ch_layout.nb_channels;
+    const int storedBits =
+        std::max(parameters->bits_per_raw_sample, av_get_exact_bits_per_sample(parameters->codec_id));
+    info.bitsPerSample = storedBits > 16 ? 32 : 16;
+    info.duration = StreamDuration(stream);
+    info_.sound = info;
+}
+
+void Source::FindDuration() {
+    const bool guessedByRate = input_->duration_estimation_method == AVFMT_DURATION_FROM_BITRATE;
+    double whole = input_->duration > 0 ? static_cast<double>(input_->duration) / AV_TIME_BASE : 0;
+    info_.durationKnown = whole > 0 && !guessedByRate;
+    if (!info_.durationKnown) {
+        if (const double last = LastStampSeconds(); last > 0) {
+            whole = last;
+            info_.durationKnown = true;
+        } else if (whole <= 0) {
+            whole = kGuessedDuration;
+        }
+    }
+    const auto complete = [&](double& duration) {
+        if (duration <= 0 || !info_.durationKnown || guessedByRate) {
+            duration = whole;
+        }
+        info_.duration = std::max(info_.duration, duration);
+    };
+    if (info_.pictures) {
+        complete(info_.pictures->duration);
+    }
+    if (info_.sound) {
+        complete(info_.sound->duration);
+        if (info_.sound->duration < kShortestStream && info_.pictures) {
+            info_.sound.reset();
+        }
+    }
+}
+
+/// Where the last packet ends, found by reading the end of the file. 0 when the file cannot be read that way.
+double Source::LastStampSeconds() {
+    if (input_->pb == nullptr || (input_->pb->seekable & AVIO_SEEKABLE_NORMAL) == 0) {
+        return 0;
+    }
+    constexpr int64_t kTail = 2 << 20;
+    const int64_t target = std::max<int64_t>(info_.bytes - kTail, 0);
+    const bool byBytes = (input_->iformat->flags & AVFMT_NO_BYTE_SEEK) == 0;
+    const int sought =
+        byBytes ? avformat_seek_file(input_.get(), -1, INT64_MIN, target, INT64_MAX, AVSEEK_FLAG_BYTE)
+                : avformat_seek_file(input_.get(), -1, INT64_MIN, INT64_MAX / 2, INT64_MAX, 0);
+    double last = 0;
+    const av::Packet packet(av_packet_alloc());
+    while (sought >= 0 && av_read_frame(input_.get(), packet.get()) >= 0) {
+        const AVStream* stream = input_->streams[packet->stream_index];
+        const int64_t stamp = packet->pts != AV_NOPTS_VALUE ? packet->pts : packet->dts;
+        if (stamp != AV_NOPTS_VALUE) {
+            last = std::max(last, ToSeconds(MediaTime(stamp + packet->duration, stream)));
+        }
+        av_packet_unref(packet.get());
+    }
+    const int64_t start = input_->start_time != AV_NOPTS_VALUE ? input_->start_time : 0;
+    if (avformat_seek_file(input_.get(), -1, INT64_MIN, start, start, 0) < 0 &&
+        avformat_seek_file(input_.get(), -1, 0, 0, 0, AVSEEK_FLAG_BYTE) < 0) {
+        throw SourceError("cannot read \"" + info_.path + "\" from its start again");
+    }
+    return last;
+}
+
+const AVStream* Source::PictureStream() const {
+    return info_.pictures ? input_->streams[info_.pictures->index] : nullptr;
+}
+
+const AVStream* Source::SoundStream() const {
+    return info_.sound ? input_->streams[info_.sound->index] : nullptr;
+}
+
+int64_t Source::MediaTime(int64_t stamp, const AVStream* stream) const {
+    return av_rescale_q(stamp, stream->time_base, {1, kMediaSecond}) - start_;
+}
+
+} // namespace host

@@ -1,0 +1,101 @@
+// The movie file to convert: opened, its streams chosen and described. Nothing is decoded here.
+#ifndef MOVIECONV_HOST_SOURCE_H
+#define MOVIECONV_HOST_SOURCE_H
+
+#include "ffmpeg/AvHandles.h"
+
+#include <atomic>
+#include <cstdint>
+#include <optional>
+#include <stdexcept>
+#include <string>
+
+namespace host {
+
+/// The source cannot be opened or holds nothing that can be converted. The text names the file and the
+/// reason.
+class SourceError : public std::runtime_error {
+public:
+    using std::runtime_error::runtime_error;
+};
+
+struct PictureStreamInfo {
+    int index = -1;          ///< Stream number in the container.
+    std::string codec;       ///< Codec name, "h264".
+    std::string pixelFormat; ///< FFmpeg's name, "yuv420p".
+    int width = 0;           ///< As shown, after rotation.
+    int height = 0;
+    int quarterTurns = 0;  ///< Clockwise turns by 90 degrees that bring the stored picture upright.
+    bool mirrored = false; ///< The stored picture is mirrored left to right before it is turned.
+    AVRational
+        pixelAspect{};    ///< Shape of a pixel as shown, width to height; 1:1 when the source does not tell.
+    double frameRate = 0; ///< Average pictures per second.
+    double duration = 0;  ///< Seconds; estimated when the container does not tell.
+    bool interlaced = false;
+    int colorPrimaries = 2; ///< As in ISO/IEC 23091-2; 2: not stated.
+    int colorTransfer = 2;
+    int colorMatrix = 2;
+};
+
+struct SoundStreamInfo {
+    int index = -1;
+    std::string codec;
+    std::string layout; ///< "stereo", "5.1".
+    int sampleRate = 0;
+    int channels = 0;
+    int bitsPerSample = 16; ///< Of the PCM handed out: 16, or 32 for sources that hold more than 16.
+    double duration = 0;
+};
+
+struct SourceInfo {
+    std::string path;
+    std::string container;      ///< FFmpeg's long name.
+    int64_t bytes = 0;          ///< Size of the file, 0 when it has none.
+    double duration = 0;        ///< Seconds; the longer of the streams'.
+    bool durationKnown = false; ///< False when `duration` is no more than a guess.
+    std::optional<PictureStreamInfo> pictures;
+    std::optional<SoundStreamInfo> sound;
+};
+
+struct SourceChoice {
+    bool pictures = true; ///< Look for pictures at all.
+    bool sound = true;    ///< Look for sound at all.
+};
+
+/// An opened movie. One thread at a time reads from it; Interrupt may be called from any.
+class Source {
+public:
+    /// Opens `path` (bytes as the system has them) and finds the first stream of pictures and of sound that
+    /// can be decoded. Throws SourceError.
+    Source(const std::string& path, SourceChoice choice);
+    Source(const Source&) = delete;
+    Source& operator=(const Source&) = delete;
+
+    const SourceInfo& Info() const { return info_; }
+    AVFormatContext* Context() const { return input_.get(); }
+    const AVStream* PictureStream() const;
+    const AVStream* SoundStream() const;
+
+    /// A stamp of `stream` in media time, from the start of the source.
+    int64_t MediaTime(int64_t stamp, const AVStream* stream) const;
+
+    /// Makes every read fail from now on, also one that is under way.
+    void Interrupt() { interrupted_ = true; }
+
+private:
+    void Open(const std::string& path);
+    void ChooseStreams(SourceChoice choice);
+    void DescribePictures(int index);
+    void DescribeSound(int index);
+    void FindDuration();
+    double LastStampSeconds();
+
+    std::atomic<bool> interrupted_{false};
+    av::Input input_;
+    int64_t start_ = 0; // the container's first stamp, in media time
+    SourceInfo info_;
+};
+
+} // namespace host
+
+#endif

@@ -1,0 +1,454 @@
+// The decoders against real movies, whole, damaged and odd, called as the engine calls them.
+#include "host/Movie.h"
+#include "tests/host/TestMovies.h"
+
+#include <gtest/gtest.h>
+
+#include <cmath>
+#include <cstring>
+#include <filesystem>
+#include <fstream>
+
+namespace {
+
+using namespace test_movies;
+using host::Movie;
+using Args = std::vector<std::string>;
+
+struct SeenPicture {
+    double time;
+    double duration;
+    int luma; // mean of the plane
+    int width;
+    int height;
+};
+
+struct Seen {
+    std::vector<SeenPicture> pictures;
+    std::vector<int16_t> sound; // first channel
+    double soundBegin = 0;
+    int64_t largestBlock = 0; // samples
+    bool soundContinuous = true;
+};
+
+int MeanLuma(const VideoImage& image) {
+    int64_t sum = 0;
+    for (int y = 0; y < image.nHeight; ++y) {
+        for (int x = 0; x < image.nWidth; ++x) {
+            sum += image.pY[static_cast<ptrdiff_t>(y) * image.nPitchY + x];
+        }
+    }
+    return static_cast<int>(std::lround(static_cast<double>(sum) / image.nWidth / image.nHeight));
+}
+
+void TakeSound(AudioDecoder& decoder, Seen& seen) {
+    int64_t samples = 0;
+    while (const AudioFrame* block = decoder.GetNextFrame()) {
+        if (block->nLength == 0) {
+            break;
+        }
+        const int sampleBytes = block->nBitsPerSample / 8;
+        const int count = block->nLength / sampleBytes / block->nChannels;
+        if (samples == 0) {
+            seen.soundBegin = static_cast<double>(block->llTime) / 1e7;
+        }
+        const double due = seen.soundBegin + static_cast<double>(samples) / block->nSampleRate;
+        seen.soundContinuous =
+            seen.soundContinuous && std::abs(static_cast<double>(block->llTime) / 1e7 - due) < 1e-6;
+        seen.largestBlock = std::max<int64_t>(seen.largestBlock, count);
+        for (int i = 0; i < count; ++i) {
+            int16_t value = 0;
+            const int top = sampleBytes - 2; // the upper 16 bits of a wider sample
+            std::memcpy(&value,
+                        block->pData + static_cast<ptrdiff_t>(i) * block->nChannels * sampleBytes + top, 2);
+            seen.sound.push_back(value);
+        }
+        samples += count;
+    }
+}
+
+/// Everything from `begin` on, pictures first: the decoders must not depend on an even interleaving of the
+/// calls.
+Seen TakeAll(Movie& movie, double begin = 0) {
+    Seen seen;
+    VideoDecoder* pictures = movie.Pictures();
+    AudioDecoder* sound = movie.Sound();
+    if (begin > 0 && pictures != nullptr) {
+        pictures->Seek(begin, 1);
+    }
+    if (begin > 0 && sound != nullptr) {
+        sound->Seek(begin);
+    }
+    if (pictures != nullptr) {
+        for (const VideoImage* image = pictures->GetCurrentImage(); image != nullptr;
+             image = pictures->GetCurrentImage()) {
+            seen.pictures.push_back({static_cast<double>(image->llTime) / 1e7, image->nDuration / 1e7,
+                                     MeanLuma(*image), image->nWidth, image->nHeight});
+            if (pictures->DecodeNext(1) < 1) {
+                break;
+            }
+        }
+    }
+    if (sound != nullptr) {
+        TakeSound(*sound, seen);
+    }
+    return seen;
+}
+
+/// Times at which the sound becomes loud after at least 0.3 s of quiet.
+std::vector<double> Beginnings(const Seen& seen, int rate) {
+    std::vector<double> times;
+    int64_t lastLoud = -rate;
+    for (size_t i = 0; i < seen.sound.size(); ++i) {
+        if (std::abs(seen.sound[i]) > 3000) {
+            if (static_cast<int64_t>(i) - lastLoud > rate * 3 / 10) {
+                times.push_back(seen.soundBegin + static_cast<double>(i) / rate);
+            }
+            lastLoud = static_cast<int64_t>(i);
+        }
+    }
+    return times;
+}
+
+Args H264Aac() {
+    return {"-c:v", "libx264", "-preset", "veryfast", "-bf", "2", "-g", "30", "-c:a", "aac"};
+}
+
+std::string Counted4s() {
+    return Make("counted.mp4", Join(CountedPictures(4), Beeps(4), H264Aac()));
+}
+
+void ExpectCounted(const Seen& seen, int first, int count, double rate) {
+    ASSERT_EQ(seen.pictures.size(), static_cast<size_t>(count));
+    for (int i = 0; i < count; ++i) {
+        EXPECT_NEAR(seen.pictures[i].luma, LumaOf(first + i), 1) << "picture " << i;
+        if (i > 0) {
+            EXPECT_NEAR(seen.pictures[i].time, (first + i) / rate, 0.012) << "picture " << i;
+        }
+    }
+}
+
+TEST(Decoders, GiveEveryPictureOnceWithItsTimeAndAllSound) {
+    Movie movie(Counted4s(), {});
+    const VideoFormat& video = movie.Pictures()->GetVideoInfo()->format;
+    EXPECT_EQ(video.nWidth, 160);
+    EXPECT_EQ(video.nHeight, 120);
+    EXPECT_DOUBLE_EQ(video.dFrameRate, 25);
+    EXPECT_NEAR(video.dDuration, 4, 0.05);
+    const AudioFormat audio = movie.Sound()->GetAudioInfo()->format;
+    EXPECT_EQ(audio.nSampleRate, 44100);
+    EXPECT_EQ(audio.nChannels, 1);
+    EXPECT_EQ(audio.nBytesPerSecond, 88200);
+
+    const Seen seen = TakeAll(movie);
+    ExpectCounted(seen, 0, 100, 25);
+    EXPECT_EQ(seen.soundBegin, 0);
+    EXPECT_TRUE(seen.soundContinuous);
+    EXPECT_NEAR(static_cast<double>(seen.sound.size()), 4 * 44100, 1024);
+    EXPECT_LT(seen.largestBlock, 44100 / 25 / 2);
+    const std::vector<double> beeps = Beginnings(seen, 44100);
+    ASSERT_EQ(beeps.size(), 4u);
+    EXPECT_NEAR(beeps[3], 3, 0.003);
+    EXPECT_TRUE(movie.Complaints().empty());
+}
+
+TEST(Decoders, AfterTheEndGiveNothingAndStayThere) {
+    Movie movie(Counted4s(), {});
+    TakeAll(movie);
+    EXPECT_LT(movie.Pictures()->DecodeNext(1), 1);
+    EXPECT_EQ(movie.Pictures()->GetCurrentImage(), nullptr);
+    EXPECT_EQ(movie.Sound()->GetNextFrame(), nullptr);
+}
+
+struct SeekCase {
+    const char* name;
+    std::string (*movie)();
+    double begin;
+    int firstPicture;
+};
+
+class DecodersSeek : public testing::TestWithParam<SeekCase> {};
+
+TEST_P(DecodersSeek, StartExactlyAtTheBeginTime) {
+    Movie movie(GetParam().movie(), {});
+    const double begin = GetParam().begin;
+    const Seen seen = TakeAll(movie, begin);
+    ASSERT_FALSE(seen.pictures.empty());
+    EXPECT_NEAR(seen.pictures[0].time, begin, 1e-6);
+    ExpectCounted(seen, GetParam().firstPicture, 100 - GetParam().firstPicture, 25);
+    EXPECT_NEAR(seen.soundBegin, begin, 1e-6);
+    EXPECT_NEAR(static_cast<double>(seen.sound.size()), (4 - begin) * 44100, 1200);
+    const std::vector<double> beeps = Beginnings(seen, 44100);
+    ASSERT_FALSE(beeps.empty());
+    EXPECT_NEAR(beeps.back(), 3, 0.012);
+}
+
+std::string CountedTs() {
+    return Make("counted.ts", Join(CountedPictures(4), Beeps(4), H264Aac(), Args{"-c:a", "mp2"}));
+}
+std::string CountedMkv() {
+    return Make("counted.mkv", Join(CountedPictures(4), Beeps(4),
+                                    Args{"-c:v", "mpeg4", "-q:v", "2", "-g", "30", "-c:a", "pcm_s16le"}));
+}
+std::string CountedOneKeyPicture() {
+    return Make("onekey.mp4", Join(CountedPictures(4), Beeps(4), H264Aac(), Args{"-g", "1000"}));
+}
+
+INSTANTIATE_TEST_SUITE_P(Movies, DecodersSeek,
+                         testing::Values(SeekCase{"OnAPicture", Counted4s, 2.0, 50},
+                                         SeekCase{"BetweenPictures", Counted4s, 1.23, 30},
+                                         SeekCase{"JustAfterAKeyPicture", Counted4s, 1.25, 31},
+                                         SeekCase{"NearTheStart", Counted4s, 0.05, 1},
+                                         SeekCase{"TransportStream", CountedTs, 2.5, 62},
+                                         SeekCase{"Matroska", CountedMkv, 2.41, 60},
+                                         SeekCase{"FarFromAKeyPicture", CountedOneKeyPicture, 3.0, 75}),
+                         [](const auto& test) { return test.param.name; });
+
+TEST(Decoders, KeepTheStampsOfAVariableRate) {
+    // Pictures 0, 1, 2, 6, 7, 8, 12 ... of a steady sequence.
+    const std::string path =
+        Make("variable.mkv",
+             {"-f", "lavfi", "-i",
+              "color=gray:s=160x120:r=25:d=4,format=yuv420p,geq=lum='20+mod(N,50)*4':cb=128:cr=128,"
+              "select='lt(mod(n,6),3)'",
+              "-fps_mode", "vfr", "-c:v", "libx264", "-bf", "2"});
+    Movie movie(path, {});
+    const Seen seen = TakeAll(movie);
+    ASSERT_EQ(seen.pictures.size(), 51u);
+    for (size_t i = 0; i < seen.pictures.size(); ++i) {
+        const int original = static_cast<int>(i / 3 * 6 + i % 3);
+        EXPECT_NEAR(seen.pictures[i].time, original / 25.0, 0.0011) << i;
+        EXPECT_NEAR(seen.pictures[i].luma, LumaOf(original), 1) << i;
+    }
+    EXPECT_NEAR(seen.pictures[2].duration, 4 / 25.0, 0.0011);
+}
+
+struct SoundCase {
+    const char* name;
+    Args encoding;
+    const char* extension;
+    int channels;
+    int rate;
+    int bits;
+};
+
+class DecodersSound : public testing::TestWithParam<SoundCase> {};
+
+TEST_P(DecodersSound, BecomesInterleavedPcm) {
+    const SoundCase& test = GetParam();
+    Movie movie(Make(std::string("sound-") + test.name + "." + test.extension, Join(Beeps(2), test.encoding)),
+                {});
+    EXPECT_EQ(movie.Pictures(), nullptr);
+    const AudioFormat format = movie.Sound()->GetAudioInfo()->format;
+    EXPECT_EQ(format.nChannels, test.channels);
+    EXPECT_EQ(format.nSampleRate, test.rate);
+    EXPECT_EQ(format.nBitsPerSample, test.bits);
+    EXPECT_EQ(format.nBytesPerSecond, test.rate * test.channels * test.bits / 8);
+    const Seen seen = TakeAll(movie);
+    EXPECT_NEAR(static_cast<double>(seen.sound.size()) / test.rate, 2, 0.05);
+    const std::vector<double> beeps = Beginnings(seen, test.rate);
+    ASSERT_EQ(beeps.size(), 2u);
+    EXPECT_NEAR(beeps[1], 1, 0.006);
+}
+
+INSTANTIATE_TEST_SUITE_P(
+    Forms, DecodersSound,
+    testing::Values(SoundCase{"Mono8Bit", {"-c:a", "pcm_u8", "-ar", "8000"}, "wav", 1, 8000, 16},
+                    SoundCase{"FivePointOne",
+                              {"-c:a", "ac3", "-ar", "48000", "-af", "pan=5.1|c0=c0|c1=c0|c2=c0"},
+                              "ac3",
+                              6,
+                              48000,
+                              16},
+                    SoundCase{"Deep", {"-c:a", "pcm_s24le"}, "wav", 1, 44100, 32},
+                    SoundCase{"Mp3", {"-c:a", "libmp3lame", "-ac", "2"}, "mp3", 2, 44100, 16},
+                    SoundCase{"Vorbis", {"-c:a", "libvorbis", "-ac", "2"}, "ogg", 2, 44100, 16}),
+    [](const auto& test) { return test.param.name; });
+
+TEST(Decoders, FillTheTimeBeforeLateSound) {
+    const std::string path = Make("late.mkv", Join(CountedPictures(4), Args{"-itsoffset", "1.3"}, Beeps(2),
+                                                   Args{"-c:v", "mpeg4", "-q:v", "2", "-c:a", "pcm_s16le"}));
+    Movie movie(path, {});
+    const Seen seen = TakeAll(movie);
+    EXPECT_EQ(seen.soundBegin, 0);
+    EXPECT_NEAR(static_cast<double>(seen.sound.size()), 3.3 * 44100, 60);
+    const std::vector<double> beeps = Beginnings(seen, 44100);
+    ASSERT_EQ(beeps.size(), 2u);
+    EXPECT_NEAR(beeps[0], 1.3, 0.002);
+    EXPECT_NEAR(beeps[1], 2.3, 0.002);
+}
+
+TEST(Decoders, HoldTheFirstPictureWhenSoundBeginsFirst) {
+    const std::string path = Make("early.mkv", Join(Args{"-itsoffset", "0.72"}, CountedPictures(2), Beeps(3),
+                                                    Args{"-c:v", "mpeg4", "-q:v", "2", "-c:a", "pcm_s16le"}));
+    Movie movie(path, {});
+    const Seen seen = TakeAll(movie);
+    ASSERT_EQ(seen.pictures.size(), 50u);
+    EXPECT_EQ(seen.pictures[0].time, 0);
+    EXPECT_NEAR(seen.pictures[1].time, 0.76, 0.001);
+    EXPECT_EQ(seen.soundBegin, 0);
+}
+
+TEST(Decoders, TurnPicturesUpright) {
+    // The left half is bright; turned counter-clockwise, as the container asks, it is the lower half.
+    const std::string flat = Make("half.mp4", {"-f", "lavfi", "-i",
+                                               "color=black:s=160x120:r=25:d=0.2,format=yuv420p,"
+                                               "drawbox=w=80:c=white:t=fill",
+                                               "-c:v", "libx264", "-qp", "10"});
+    Movie movie(Make("turned.mp4", {"-i", flat, "-c", "copy", "-metadata:s:v", "rotate=90"}), {});
+    const VideoFormat& format = movie.Pictures()->GetVideoInfo()->format;
+    EXPECT_EQ(format.nWidth, 120);
+    EXPECT_EQ(format.nHeight, 160);
+    const VideoImage* image = movie.Pictures()->GetCurrentImage();
+    ASSERT_NE(image, nullptr);
+    ASSERT_EQ(image->nWidth, 120);
+    ASSERT_EQ(image->nHeight, 160);
+    EXPECT_LT(image->pY[20 * image->nPitchY + 60], 40);
+    EXPECT_GT(image->pY[140 * image->nPitchY + 60], 200);
+}
+
+TEST(Decoders, BringOtherFormatsToVideoRange) {
+    for (const char* format : {"yuvj420p", "yuv444p", "yuv420p10le", "bgr0"}) {
+        const bool lossless = std::string(format) != "yuvj420p";
+        Movie movie(
+            Make(std::string("format-") + format + ".mkv",
+                 Join(Args{"-f", "lavfi", "-i", "color=white:s=160x120:r=25:d=0.2", "-vf", "scale=161:121"},
+                      Args{"-pix_fmt", format, "-c:v", lossless ? "ffv1" : "mjpeg"})),
+            {});
+        const Seen seen = TakeAll(movie);
+        ASSERT_EQ(seen.pictures.size(), 5u) << format;
+        EXPECT_EQ(seen.pictures[0].width, 161) << format;
+        EXPECT_EQ(seen.pictures[0].height, 121) << format;
+        EXPECT_NEAR(seen.pictures[0].luma, 235, 2) << format;
+    }
+}
+
+TEST(Decoders, TakeASinglePictureAndAMovieWithoutSound) {
+    Movie one(Make("one.mp4", Join(CountedPictures(0.04), Args{"-c:v", "libx264"})), {});
+    EXPECT_EQ(one.Sound(), nullptr);
+    const Seen seen = TakeAll(one);
+    ASSERT_EQ(seen.pictures.size(), 1u);
+    EXPECT_EQ(seen.pictures[0].time, 0);
+    EXPECT_NEAR(seen.pictures[0].duration, 0.04, 0.001);
+}
+
+std::string CopyPart(const std::string& path, const std::string& target, double part) {
+    std::filesystem::copy_file(path, target, std::filesystem::copy_options::overwrite_existing);
+    std::filesystem::resize_file(
+        target, static_cast<uintmax_t>(static_cast<double>(std::filesystem::file_size(path)) * part));
+    return target;
+}
+
+TEST(Decoders, GiveWhatATruncatedMovieHolds) {
+    const Folder folder;
+    Movie movie(CopyPart(CountedTs(), folder / "cut.ts", 0.6), {});
+    const Seen seen = TakeAll(movie);
+    EXPECT_GT(seen.pictures.size(), 40u);
+    EXPECT_LT(seen.pictures.size(), 80u);
+    for (size_t i = 0; i + 1 < seen.pictures.size(); ++i) {
+        EXPECT_NEAR(seen.pictures[i].luma, LumaOf(static_cast<int>(i)), 2) << i;
+    }
+    EXPECT_NEAR(movie.Info().duration, static_cast<double>(seen.pictures.size()) / 25, 0.3);
+}
+
+TEST(Decoders, SayWhyAMovieWithoutItsIndexCannotBeOpened) {
+    const Folder folder;
+    const std::string path = CopyPart(Counted4s(), folder / "cut.mp4", 0.5);
+    try {
+        const Movie movie(path, {});
+        FAIL() << "opened a movie without its index";
+    } catch (const host::SourceError& error) {
+        EXPECT_NE(std::string(error.what()).find("cut.mp4"), std::string::npos) << error.what();
+        EXPECT_NE(std::string(error.what()).find("index"), std::string::npos) << error.what();
+    }
+}
+
+TEST(Decoders, SkipDamagedDataAndKeepTime) {
+    const Folder folder;
+    const std::string path = folder / "damaged.ts";
+    std::filesystem::copy_file(CountedTs(), path);
+    std::fstream file(path, std::ios::in | std::ios::out | std::ios::binary);
+    const auto size = static_cast<std::streamoff>(std::filesystem::file_size(path));
+    for (std::streamoff at = size / 3; at < size / 3 + 6000; at += 40) {
+        file.seekp(at);
+        file.put('\x55');
+    }
+    file.close();
+    Movie movie(path, {});
+    const Seen seen = TakeAll(movie);
+    EXPECT_GT(seen.pictures.size(), 60u);
+    for (size_t i = 1; i < seen.pictures.size(); ++i) {
+        EXPECT_GT(seen.pictures[i].time, seen.pictures[i - 1].time) << i;
+    }
+    EXPECT_NEAR(seen.pictures.back().time, 3.96, 0.05);
+    const std::vector<double> beeps = Beginnings(seen, 44100);
+    ASSERT_FALSE(beeps.empty());
+    EXPECT_NEAR(beeps.back(), 3, 0.03);
+    EXPECT_FALSE(movie.Complaints().empty());
+}
+
+TEST(Decoders, JoinRecordingsThatStartANewClock) {
+    const Folder folder;
+    const std::string path = folder / "joined.ts";
+    std::ofstream joined(path, std::ios::binary);
+    for (const std::string& part :
+         {Make("late-clock.ts", Join(CountedPictures(4), Beeps(4), H264Aac(),
+                                     Args{"-c:a", "mp2", "-output_ts_offset", "5000"})),
+          CountedTs()}) {
+        joined << std::ifstream(part, std::ios::binary).rdbuf();
+    }
+    joined.close();
+    Movie movie(path, {});
+    const Seen seen = TakeAll(movie);
+    EXPECT_EQ(seen.pictures.size(), 200u);
+    EXPECT_NEAR(seen.pictures.back().time, 7.96, 0.2);
+    EXPECT_NEAR(static_cast<double>(seen.sound.size()) / 44100, 8, 0.2);
+}
+
+TEST(Decoders, EstimateTheLengthOfAStreamThatTellsNone) {
+    Movie movie(Make("raw.h264", Join(CountedPictures(4), Args{"-c:v", "libx264", "-preset", "veryfast"})),
+                {});
+    EXPECT_GT(movie.Info().duration, 0.5);
+    EXPECT_TRUE(std::isfinite(movie.Info().duration));
+    const Seen seen = TakeAll(movie);
+    EXPECT_EQ(seen.pictures.size(), 100u);
+    EXPECT_NEAR(seen.pictures.back().time, 3.96, 0.05);
+}
+
+TEST(Decoders, LeaveOutWhatIsNotAskedFor) {
+    Movie silent(Counted4s(), {.pictures = true, .sound = false});
+    EXPECT_EQ(silent.Sound(), nullptr);
+    EXPECT_EQ(TakeAll(silent).pictures.size(), 100u);
+    Movie blind(Counted4s(), {.pictures = false, .sound = true});
+    EXPECT_EQ(blind.Pictures(), nullptr);
+    EXPECT_NEAR(static_cast<double>(TakeAll(blind, 1).sound.size()), 3 * 44100, 1200);
+}
+
+TEST(Decoders, EndAtOnceWhenStopped) {
+    Movie movie(Counted4s(), {});
+    ASSERT_NE(movie.Pictures()->GetCurrentImage(), nullptr);
+    std::thread stopper([&] { movie.Stop(); });
+    while (movie.Pictures()->DecodeNext(1) >= 1) {
+    }
+    while (movie.Sound()->GetNextFrame() != nullptr) {
+    }
+    stopper.join();
+    EXPECT_EQ(movie.Pictures()->GetCurrentImage(), nullptr);
+}
+
+TEST(Decoders, GoAwayHalfRead) {
+    Movie movie(Counted4s(), {});
+    ASSERT_NE(movie.Pictures()->GetCurrentImage(), nullptr);
+    ASSERT_NE(movie.Sound()->GetNextFrame(), nullptr);
+}
+
+TEST(Decoders, RefuseWhatIsNoMovie) {
+    const Folder folder;
+    std::ofstream(folder / "text.mp4") << "this is no movie\n";
+    std::ofstream(folder / "empty.mp4").close();
+    for (const char* name : {"text.mp4", "empty.mp4", "missing.mp4"}) {
+        EXPECT_THROW(Movie(folder / name, {}), host::SourceError) << name;
+    }
+}
+
+} // namespace

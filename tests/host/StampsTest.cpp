@@ -1,0 +1,116 @@
+#include "host/MediaTime.h"
+#include "host/SoundTimeline.h"
+#include "host/StampRepair.h"
+
+#include <gtest/gtest.h>
+
+#include <optional>
+#include <vector>
+
+namespace {
+
+using host::SoundTimeline;
+using host::StampRepair;
+
+constexpr int64_t kStep = 400'000;
+constexpr std::optional<int64_t> kNone;
+
+std::vector<int64_t> Repair(const std::vector<std::optional<int64_t>>& stamps, int expectedRepairs) {
+    StampRepair repair(kStep);
+    std::vector<int64_t> times;
+    for (const auto& stamp : stamps) {
+        if (const auto settled = repair.Push(stamp)) {
+            times.push_back(settled->time);
+        }
+    }
+    if (const auto last = repair.Finish()) {
+        times.push_back(last->time);
+    }
+    EXPECT_EQ(repair.Repaired(), expectedRepairs);
+    return times;
+}
+
+using Times = std::vector<int64_t>;
+
+TEST(StampRepair, LeavesRisingStampsAlone) {
+    EXPECT_EQ(Repair({}, 0), Times{});
+    EXPECT_EQ(Repair({70}, 0), Times{70});
+    EXPECT_EQ(Repair({-5, 3, 4, 900'000'000}, 0), (Times{-5, 3, 4, 900'000'000}));
+}
+
+TEST(StampRepair, PutsAMissingStampOneStepOnOrBetweenItsNeighbours) {
+    EXPECT_EQ(Repair({0, kNone, kNone}, 2), (Times{0, kStep, 2 * kStep}));
+    EXPECT_EQ(Repair({0, kNone, 2 * kStep}, 1), (Times{0, kStep, 2 * kStep}));
+    EXPECT_EQ(Repair({0, kNone, 100}, 1), (Times{0, 50, 100}));
+    EXPECT_EQ(Repair({kNone, kStep * 3}, 1), (Times{kStep * 2, kStep * 3}));
+}
+
+TEST(StampRepair, LiftsEqualAndFallingStamps) {
+    EXPECT_EQ(Repair({0, 0, 2 * kStep}, 1), (Times{0, kStep, 2 * kStep}));
+    EXPECT_EQ(Repair({5 * kStep, kStep, 2 * kStep}, 2), (Times{5 * kStep, 6 * kStep, 7 * kStep}));
+}
+
+TEST(StampRepair, PassesOverASingleWildStamp) {
+    EXPECT_EQ(Repair({0, 900'000'000, 2 * kStep, 3 * kStep}, 1), (Times{0, kStep, 2 * kStep, 3 * kStep}));
+}
+
+TEST(StampRepair, GivesTheDistanceToTheNextPictureAsDuration) {
+    StampRepair repair(kStep);
+    EXPECT_FALSE(repair.Push(0));
+    EXPECT_EQ(repair.Push(123)->duration, 123);
+    EXPECT_EQ(repair.Finish()->duration, kStep);
+}
+
+constexpr int kRate = 1000; // samples a second: a sample is a millisecond
+
+int64_t Ms(int64_t milliseconds) {
+    return milliseconds * (host::kMediaSecond / 1000);
+}
+
+void ExpectPlaced(const SoundTimeline::Placement& placement, int64_t silence, int64_t cut) {
+    EXPECT_EQ(placement.silence, silence);
+    EXPECT_EQ(placement.cut, cut);
+}
+
+TEST(SoundTimeline, BeginsAtTheSample) {
+    SoundTimeline early(kRate, Ms(500));
+    ExpectPlaced(early.Place(Ms(470), 20), 0, 20);
+    ExpectPlaced(early.Place(Ms(490), 20), 0, 10);
+    ExpectPlaced(early.Place(Ms(510), 20), 0, 0);
+    EXPECT_EQ(early.Position(), 30);
+    SoundTimeline late(kRate, Ms(500));
+    ExpectPlaced(late.Place(Ms(503), 20), 3, 0);
+    EXPECT_EQ(late.Corrections(), 0);
+}
+
+TEST(SoundTimeline, IgnoresRoundingAndMissingStamps) {
+    SoundTimeline timeline(kRate, 0);
+    ExpectPlaced(timeline.Place(0, 100), 0, 0);
+    ExpectPlaced(timeline.Place(Ms(120), 100), 0, 0);
+    ExpectPlaced(timeline.Place(std::nullopt, 100), 0, 0);
+    ExpectPlaced(timeline.Place(Ms(280), 100), 0, 0);
+    EXPECT_EQ(timeline.Position(), 400);
+    EXPECT_EQ(timeline.Corrections(), 0);
+}
+
+TEST(SoundTimeline, FillsGapsAndCutsOverlaps) {
+    SoundTimeline timeline(kRate, 0);
+    timeline.Place(0, 100);
+    ExpectPlaced(timeline.Place(Ms(300), 100), 200, 0);
+    ExpectPlaced(timeline.Place(Ms(340), 100), 0, 60);
+    EXPECT_EQ(timeline.Position(), 440);
+    EXPECT_EQ(timeline.Corrections(), 2);
+}
+
+TEST(SoundTimeline, NeedsASecondWitnessForALargeGap) {
+    SoundTimeline timeline(kRate, 0);
+    timeline.Place(0, 100);
+    ExpectPlaced(timeline.Place(Ms(900'000), 100), 0, 0);
+    ExpectPlaced(timeline.Place(Ms(200), 100), 0, 0);
+    EXPECT_EQ(timeline.Position(), 300);
+    ExpectPlaced(timeline.Place(Ms(8300), 100), 0, 0);
+    ExpectPlaced(timeline.Place(Ms(8400), 100), 8000, 0);
+    EXPECT_EQ(timeline.Position(), 8500);
+}
+
+} // namespace

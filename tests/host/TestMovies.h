@@ -1,0 +1,52 @@
+// Short movies for the tests, made once with the ffmpeg program and kept in the build directory.
+#ifndef MOVIECONV_TESTS_HOST_TESTMOVIES_H
+#define MOVIECONV_TESTS_HOST_TESTMOVIES_H
+
+#include <string>
+#include <vector>
+
+namespace test_movies {
+
+/// Runs a program with its output discarded and returns its exit code; 128 plus the signal that ended it.
+int RunProgram(const std::vector<std::string>& arguments);
+
+/// The path of the movie `name`, made with `ffmpeg ARGUMENTS PATH` unless it exists. Fails the test when it
+/// cannot be.
+std::string Make(const std::string& name, const std::vector<std::string>& arguments);
+
+/// ffmpeg arguments for pictures of 160 x 120 whose brightness counts them: picture n has luma LumaOf(n).
+std::vector<std::string> CountedPictures(double seconds, const std::string& rate = "25");
+/// ffmpeg arguments for white flashes of 80 ms at every whole second.
+std::vector<std::string> Flashes(double seconds);
+/// ffmpeg arguments for beeps of 80 ms at every whole second.
+std::vector<std::string> Beeps(double seconds);
+
+constexpr int kCountedLumas = 50;
+constexpr int LumaOf(int picture) {
+    return 20 + picture % kCountedLumas * 4;
+}
+
+/// A folder of the test's own, removed with what is in it.
+class Folder {
+public:
+    Folder();
+    ~Folder();
+    Folder(const Folder&) = delete;
+    Folder& operator=(const Folder&) = delete;
+    std::string operator/(const std::string& name) const { return path_ + "/" + name; }
+    const std::string& Path() const { return path_; }
+
+private:
+    std::string path_;
+};
+
+template <class... Lists>
+std::vector<std::string> Join(Lists... lists) {
+    std::vector<std::string> all;
+    (all.insert(all.end(), lists.begin(), lists.end()), ...);
+    return all;
+}
+
+} // namespace test_movies
+
+#endif
