@@ -1,0 +1,37 @@
+// For tests that run once for every kernel level.
+#ifndef MOVIECONV_TESTS_IMAGE_LEVELS_H
+#define MOVIECONV_TESTS_IMAGE_LEVELS_H
+
+#include "Common/Image/kernels/RowKernels.h"
+
+#include <string>
+
+#include <gtest/gtest.h>
+
+inline std::string LevelName(const testing::TestParamInfo<image::KernelLevel>& info) {
+    switch (info.param) {
+    case image::KernelLevel::kPlain:
+        return "Plain";
+    case image::KernelLevel::kSse41:
+        return "Sse41";
+    case image::KernelLevel::kAvx2:
+        return "Avx2";
+    case image::KernelLevel::kAvx512:
+        return "Avx512";
+    }
+    return "Unknown";
+}
+
+/// Skips a level that the machine lacks.
+class LevelTest : public testing::TestWithParam<image::KernelLevel> {
+protected:
+    void SetUp() override {
+        kernels = image::RowKernelsFor(GetParam());
+        if (kernels == nullptr)
+            GTEST_SKIP() << "this machine lacks the level";
+    }
+
+    const image::RowKernels* kernels = nullptr;
+};
+
+#endif
