@@ -33,6 +33,8 @@
 #include <cstddef>
 #include <cstdint>
 
+#pragma pack(push, 2) // in a bitmap file the header follows 14 other bytes
+
 /// The bitmap information header of the GDI. The conversions read biWidth and biHeight, the size in pixels,
 /// and, where they check it, biBitCount.
 struct tagBITMAPINFOHEADER {
@@ -56,6 +58,8 @@ struct tagBITMAPINFO {
     unsigned char bmiColors[4];
 };
 static_assert(offsetof(tagBITMAPINFO, bmiColors) == 40);
+
+#pragma pack(pop)
 
 struct VideoImage;
 

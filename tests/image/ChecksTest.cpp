@@ -1,0 +1,163 @@
+// What the routines say and do when a precondition is broken.
+#include "tests/image/TestPicture.h"
+
+#include <csignal>
+#include <cstring>
+#include <functional>
+#include <limits>
+
+#include <sys/mman.h>
+
+namespace {
+
+unsigned char buffer[64];
+unsigned char* const kSome = buffer;
+tagBITMAPINFOHEADER header24 = BitmapHeader(1, 1, 24);
+tagBITMAPINFOHEADER header32 = BitmapHeader(1, 1, 32);
+
+void ExpectFailedCheck(const std::function<void()>& call, unsigned line, const std::string& condition) {
+    const std::string message = "../../Common/Image/ImageConvert.cpp:" + std::to_string(line) +
+                                ": failed assertion `" + condition + "'\n";
+    EXPECT_EXIT(call(), testing::KilledBySignal(SIGABRT),
+                testing::Matcher<const std::string&>(testing::Eq(message)))
+        << "line " << line;
+}
+
+using ToYuv = void (*)(unsigned char*, unsigned char*, unsigned char*, int, int, int, tagBITMAPINFOHEADER*,
+                       unsigned char*);
+using ToRgb = void (*)(tagBITMAPINFOHEADER*, unsigned char*, unsigned char*, unsigned char*, unsigned char*,
+                       int, int, int);
+
+void Rgb32ToYuvWithAlpha(unsigned char* y, unsigned char* u, unsigned char* v, int, int, int,
+                         tagBITMAPINFOHEADER* header, unsigned char* bits) {
+    Rgb32_2_yuv420A(y, u, v, kSome, 1, 1, 1, header, bits, 1);
+}
+
+void Rgb32ToYuvWithAlphaR(unsigned char* y, unsigned char* u, unsigned char* v, int, int, int,
+                          tagBITMAPINFOHEADER* header, unsigned char* bits) {
+    Rgb32_2_yuv420A_R(y, u, v, kSome, 1, 1, 1, header, bits);
+}
+
+TEST(ChecksDeathTest, RgbToYuv) {
+    struct Row {
+        ToYuv convert;
+        int bits;
+        unsigned line;
+    };
+    const Row rows[] = {{Rgb32_2_yuv420, 32, 652},
+                        {Argb_2_yuv420, 32, 887},
+                        {Rgb24_2_yuv420, 24, 996},
+                        {Rgb32ToYuvWithAlpha, 32, 1683},
+                        {Rgb32ToYuvWithAlphaR, 32, 1683}};
+    const std::string buffers = "lpSrcBits && pY && pU && pV";
+    for (const Row& row : rows) {
+        auto* const right = row.bits == 32 ? &header32 : &header24;
+        auto* const wrong = row.bits == 32 ? &header24 : &header32;
+        const std::string format = "lpSrcBmi && lpSrcBmi->biBitCount == " + std::to_string(row.bits);
+        const auto call = [&](unsigned char* y, unsigned char* u, unsigned char* v,
+                              tagBITMAPINFOHEADER* header, unsigned char* bits) {
+            return [=] { row.convert(y, u, v, 1, 1, 1, header, bits); };
+        };
+        ExpectFailedCheck(call(kSome, kSome, kSome, nullptr, kSome), row.line, format);
+        ExpectFailedCheck(call(nullptr, nullptr, nullptr, wrong, nullptr), row.line, format);
+        ExpectFailedCheck(call(nullptr, kSome, kSome, right, kSome), row.line + 1, buffers);
+        ExpectFailedCheck(call(kSome, nullptr, kSome, right, kSome), row.line + 1, buffers);
+        ExpectFailedCheck(call(kSome, kSome, nullptr, right, kSome), row.line + 1, buffers);
+        ExpectFailedCheck(call(kSome, kSome, kSome, right, nullptr), row.line + 1, buffers);
+    }
+    for (const int missing : {0, 1, 2, 3}) {
+        const auto at = [missing](int i) { return i == missing ? nullptr : kSome; };
+        ExpectFailedCheck([&] { Rgb32_2_yuv420_Ex(at(0), at(1), at(2), 1, 1, 1, at(3), 0, 0, 0); }, 761,
+                          buffers);
+    }
+}
+
+TEST(ChecksDeathTest, YuvToRgb) {
+    struct Row {
+        ToRgb convert;
+        int bits;
+        unsigned line;
+    };
+    const Row rows[] = {{Yuv420_2_rgb24, 24, 283}, {Yuv420_2_rgb32, 32, 414}, {Yuv420_2_Argb, 32, 529}};
+    for (const Row& row : rows) {
+        auto* const right = row.bits == 32 ? &header32 : &header24;
+        auto* const wrong = row.bits == 32 ? &header24 : &header32;
+        const std::string format = "lpDstBmi && lpDstBmi->biBitCount == " + std::to_string(row.bits);
+        ExpectFailedCheck([&] { row.convert(nullptr, kSome, kSome, kSome, kSome, 1, 1, 1); }, row.line,
+                          format);
+        ExpectFailedCheck([&] { row.convert(wrong, nullptr, kSome, kSome, kSome, 1, 1, 1); }, row.line,
+                          format);
+        for (const int missing : {0, 1, 2, 3}) {
+            const auto at = [missing](int i) { return i == missing ? nullptr : kSome; };
+            ExpectFailedCheck([&] { row.convert(right, at(0), at(1), at(2), at(3), 1, 1, 1); }, row.line + 1,
+                              "lpDstBits && pY && pU && pV");
+        }
+    }
+}
+
+TEST(ChecksDeathTest, Packed) {
+    const auto toPacked = [](unsigned char* to, int pitchTo, int xDst, int cx, unsigned char* from,
+                             int pitchFrom, int xSrc) {
+        return [=] { Rgb24_2_YUY2(to, pitchTo, xDst, 0, cx, 1, 1, from, 1, pitchFrom, xSrc, 0); };
+    };
+    constexpr int kMost = std::numeric_limits<int>::max();
+    const std::string buffers = "lpBitsDst && lpBitsSrc";
+    ExpectFailedCheck(toPacked(nullptr, 8, 0, 2, kSome, 30, 0), 1110, buffers);
+    ExpectFailedCheck(toPacked(kSome, 8, 0, 2, nullptr, 30, 0), 1110, buffers);
+    ExpectFailedCheck(toPacked(kSome, 8, 1, 4, kSome, 30, 0), 1111, "(xDst + cxDst) * 2 <= nPitchDst");
+    ExpectFailedCheck(toPacked(kSome, 8, kMost, kMost, kSome, 30, 0), 1111,
+                      "(xDst + cxDst) * 2 <= nPitchDst");
+    ExpectFailedCheck(toPacked(kSome, 8, 0, 3, kSome, 30, 8), 1112, "nPitchSrc / 3 - xSrc >= cxDst");
+    ExpectFailedCheck(toPacked(kSome, 8, 0, 0, kSome, -4, 0), 1112, "nPitchSrc / 3 - xSrc >= cxDst");
+
+    ExpectFailedCheck([] { YUY2_2_Rgb24(nullptr, 1, 6, 0, 0, 2, 1, kSome, 4, 1, 0, 0); }, 1232, buffers);
+    ExpectFailedCheck([] { YUY2_2_Rgb24(kSome, 1, 6, 0, 0, 0, 0, nullptr, 4, 1, 0, 0); }, 1232, buffers);
+}
+
+/// Memory that a process which is about to die shares with this one.
+class SharedBytes {
+public:
+    explicit SharedBytes(size_t size)
+        : bytes(static_cast<unsigned char*>(
+              mmap(nullptr, size, PROT_READ | PROT_WRITE, MAP_SHARED | MAP_ANONYMOUS, -1, 0))),
+          size(size) {}
+    ~SharedBytes() { munmap(bytes, size); }
+    SharedBytes(const SharedBytes&) = delete;
+    SharedBytes& operator=(const SharedBytes&) = delete;
+
+    unsigned char* const bytes;
+
+private:
+    const size_t size;
+};
+
+TEST(ChecksDeathTest, PackedToPlanesStopsBeforeTheFirstSampleOutside) {
+    // V begins in row yDst / 2 = 2, the bound is the first sample of row ySrc + cy = 2: the group 0 of the
+    // first pair of rows is inside, the group 1 is not.
+    constexpr int kWidth = 8;
+    SharedBytes planes(6 * kWidth * 3);
+    unsigned char* const y = planes.bytes;
+    unsigned char* const u = y + 6 * kWidth;
+    unsigned char* const v = u + 6 * kWidth;
+    unsigned char packed[2 * kWidth * 2];
+    std::memset(packed, 200, sizeof packed);
+    ExpectFailedCheck(
+        [&] { YUY2_2_Yuv420(y, u, v, kWidth, kWidth, kWidth, 0, 4, kWidth, 2, packed, 2 * kWidth, 1, 0, 0); },
+        1452, "(char*)V <= ((char*)pV + (ySrc + cy) * nPt_V)");
+    for (int i = 0; i < 6 * kWidth; ++i) {
+        const int row = i / kWidth;
+        const int column = i % kWidth;
+        EXPECT_EQ(y[i], (row == 4 || row == 5) && column < 2 ? 200 : 0) << "Y " << row << ", " << column;
+        EXPECT_EQ(u[i], row == 2 && column == 0 ? 200 : 0) << "U " << row << ", " << column;
+        EXPECT_EQ(v[i], row == 2 && column == 0 ? 200 : 0) << "V " << row << ", " << column;
+    }
+}
+
+TEST(Checks, TopDownAlphaMakesNone) {
+    unsigned char pixel[]{1, 2, 3, 44};
+    unsigned char y, u, v, a;
+    Rgb32_2_yuv420A(&y, &u, &v, &a, 1, 1, 1, &header24, pixel, 0);
+    EXPECT_EQ(a, 44);
+}
+
+} // namespace
