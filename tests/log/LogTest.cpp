@@ -8,7 +8,6 @@
 #include <cstdlib>
 #include <filesystem>
 #include <functional>
-#include <regex>
 #include <string>
 #include <thread>
 #include <vector>
@@ -47,8 +46,8 @@ class Logging : public testing::Test {
 protected:
     Logging() : directory(fs::temp_directory_path() / ("dylog " + std::to_string(getpid()))) {
         fs::create_directories(directory);
-        g_bundle = {"file://localhost" + std::regex_replace(directory.native(), std::regex(" "), "%20") +
-                    "/"};
+        g_bundle = {"file://localhost" + fs::temp_directory_path().native() + "/dylog%20" +
+                    std::to_string(getpid()) + "/"};
     }
     ~Logging() override {
         EXPECT_EQ(g_bundle.urlsOut, 0);
