@@ -1,13 +1,14 @@
-// What the engine asks of the host's decoders. A host derives from these classes and implements the pure operations;
-// the reserved ones only keep the positions in the virtual table, which are part of the contract.
+// What the engine asks of the host's decoders. A host derives from these classes and implements the pure
+// operations; the reserved ones only keep the positions in the virtual table, which are part of the contract.
 //
-// Ownership: the host owns its decoders and keeps them alive until MCDestroy. Every pointer that an operation returns
-// points into the decoder's own memory and must stay valid until the next call on the same decoder; the record that
-// GetCurrentImage returned is read once more after DecodeNext, when the output is split. The engine never writes
-// through these pointers.
+// Ownership: the host owns its decoders and keeps them alive until MCDestroy. Every pointer that an operation
+// returns points into the decoder's own memory and must stay valid until the next call on the same decoder;
+// the record that GetCurrentImage returned is read once more after DecodeNext, when the output is split. The
+// engine never writes through these pointers.
 //
-// Threads: GetVideoInfo and GetAudioInfo are called on the host's thread and on the engine's worker, possibly at the
-// same time; everything else is called on the worker only. Seek comes at most once, before the first picture or block.
+// Threads: GetVideoInfo and GetAudioInfo are called on the host's thread and on the engine's worker, possibly
+// at the same time; everything else is called on the worker only. Seek comes at most once, before the first
+// picture or block.
 #ifndef MOVIECONV_MEDIA_DECODERS_H
 #define MOVIECONV_MEDIA_DECODERS_H
 
@@ -28,8 +29,8 @@ public:
     /// The source's description; null when the source could not be opened.
     virtual VideoSourceInfo* GetVideoInfo() = 0;
 
-    /// Moves to the picture shown at `seconds` from the start of the source. `mode` is always 1. The engine ignores
-    /// the result; by custom it is the position reached, in seconds.
+    /// Moves to the picture shown at `seconds` from the start of the source. `mode` is always 1. The engine
+    /// ignores the result; by custom it is the position reached, in seconds.
     virtual double Seek(double seconds, int mode) = 0;
 
     virtual void Reserved7() {}
@@ -37,7 +38,8 @@ public:
     /// The picture at the current position; null when there is none.
     virtual VideoImage* GetCurrentImage() = 0;
 
-    /// Moves on by one picture; `mode` is always 1. At least 1 when a further picture is ready, less at the end.
+    /// Moves on by one picture; `mode` is always 1. At least 1 when a further picture is ready, less at the
+    /// end.
     virtual int DecodeNext(int mode) = 0;
 
 protected:

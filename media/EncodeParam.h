@@ -1,5 +1,5 @@
-// The encoding parameters that cross the exported interface and reach the media writer, and the writer's table of
-// file formats. Both records have the same layout in every build.
+// The encoding parameters that cross the exported interface and reach the media writer, and the writer's
+// table of file formats. Both records have the same layout in every build.
 #ifndef MOVIECONV_MEDIA_ENCODEPARAM_H
 #define MOVIECONV_MEDIA_ENCODEPARAM_H
 
@@ -11,44 +11,46 @@
 
 #pragma pack(push, 4)
 
-/// What to encode: 104 bytes, no padding. Fields that are 0 and have a counterpart in the source are completed from
-/// it by MCSetEncodeParam.
+/// What to encode: 104 bytes, no padding. Fields that are 0 and have a counterpart in the source are
+/// completed from it by MCSetEncodeParam.
 typedef struct EncodeParam {
-    uint32_t fccVideo;         ///< Video codec, "XVID" by default.
-    uint32_t fccColorFormat;   ///< Picture format handed to the media writer, "YV12" by default.
-    int32_t nBitCount;         ///< Bits per pixel of that picture format, 12 by default.
-    int32_t nWidth;            ///< Output picture width in pixels.
-    int32_t nHeight;           ///< Output picture height in pixels.
-    double dFrameRate;         ///< Output pictures per second.
-    int32_t nVideoRateMode;    ///< 0: one video bit rate; otherwise a target rate and an upper rate.
-    int32_t nVideoBitrate;     ///< Video bit rate in bits per second.
-    int32_t nVideoMaxBitrate;  ///< Upper video bit rate in bits per second, used in two-rate mode.
-    int32_t bResize;           ///< How the writer fits pictures into the output size; see the media writer.
-    uint32_t nReserved[5];     ///< Carried along, not interpreted.
-    uint32_t fccAudio;         ///< Audio codec, "AAC " by default.
-    int32_t nSampleRate;       ///< Audio samples per second and channel.
-    int32_t nChannels;         ///< Audio channels.
-    int32_t nBitsPerSample;    ///< Bits per audio sample, 16 by default.
-    int32_t nAudioRateMode;    ///< As nVideoRateMode, for sound.
-    int32_t nAudioBitrate;     ///< Audio bit rate in bits per second.
-    int32_t nAudioMaxBitrate;  ///< Upper audio bit rate in bits per second, used in two-rate mode.
-    int32_t bNoVideo;          ///< Nonzero: the output carries no pictures.
-    int32_t bNoAudio;          ///< Nonzero: the output carries no sound.
-    uint32_t fccFileFormat;    ///< Container, "MP4 " by default.
+    uint32_t fccVideo;        ///< Video codec, "XVID" by default.
+    uint32_t fccColorFormat;  ///< Picture format handed to the media writer, "YV12" by default.
+    int32_t nBitCount;        ///< Bits per pixel of that picture format, 12 by default.
+    int32_t nWidth;           ///< Output picture width in pixels.
+    int32_t nHeight;          ///< Output picture height in pixels.
+    double dFrameRate;        ///< Output pictures per second.
+    int32_t nVideoRateMode;   ///< 0: one video bit rate; otherwise a target rate and an upper rate.
+    int32_t nVideoBitrate;    ///< Video bit rate in bits per second.
+    int32_t nVideoMaxBitrate; ///< Upper video bit rate in bits per second, used in two-rate mode.
+    int32_t bResize;          ///< How the writer fits pictures into the output size; see the media writer.
+    uint32_t nReserved[5];    ///< Carried along, not interpreted.
+    uint32_t fccAudio;        ///< Audio codec, "AAC " by default.
+    int32_t nSampleRate;      ///< Audio samples per second and channel.
+    int32_t nChannels;        ///< Audio channels.
+    int32_t nBitsPerSample;   ///< Bits per audio sample, 16 by default.
+    int32_t nAudioRateMode;   ///< As nVideoRateMode, for sound.
+    int32_t nAudioBitrate;    ///< Audio bit rate in bits per second.
+    int32_t nAudioMaxBitrate; ///< Upper audio bit rate in bits per second, used in two-rate mode.
+    int32_t bNoVideo;         ///< Nonzero: the output carries no pictures.
+    int32_t bNoAudio;         ///< Nonzero: the output carries no sound.
+    uint32_t fccFileFormat;   ///< Container, "MP4 " by default.
 } EncodeParam;
 
-/// One entry of the media writer's table of file formats: 828 bytes. The engine reads only the three fields that are
-/// described as such; the text fields are the writer's, for hosts that list formats.
+/// One entry of the media writer's table of file formats: 828 bytes. The engine reads only the three fields
+/// that are described as such; the text fields are the writer's, for hosts that list formats.
 typedef struct FileFormatInfo {
-    uint32_t fccFormat;        ///< The format's code; 0 ends the table. Read by the engine.
-    char szName[128];          ///< Human-readable name, UTF-8, zero-terminated.
-    char szExtensions[128];    ///< File-name extensions without dots, separated by commas, the usual one first.
-    uint32_t fccVideoCodecs[32]; ///< Video codecs that the format carries, the default first; 0 ends the list.
-    uint32_t fccAudioCodecs[32]; ///< Audio codecs that the format carries, the default first; 0 ends the list.
+    uint32_t fccFormat;     ///< The format's code; 0 ends the table. Read by the engine.
+    char szName[128];       ///< Human-readable name, UTF-8, zero-terminated.
+    char szExtensions[128]; ///< File-name extensions without dots, separated by commas, the usual one first.
+    uint32_t
+        fccVideoCodecs[32]; ///< Video codecs that the format carries, the default first; 0 ends the list.
+    uint32_t
+        fccAudioCodecs[32]; ///< Audio codecs that the format carries, the default first; 0 ends the list.
     unsigned char reserved[296]; ///< Zero.
-    int32_t bHasAudio;         ///< 0: the format cannot carry sound. Read by the engine.
-    int32_t bHasVideo;         ///< 0: the format cannot carry pictures. Read by the engine.
-    unsigned char reserved2[8]; ///< Zero.
+    int32_t bHasAudio;           ///< 0: the format cannot carry sound. Read by the engine.
+    int32_t bHasVideo;           ///< 0: the format cannot carry pictures. Read by the engine.
+    unsigned char reserved2[8];  ///< Zero.
 } FileFormatInfo;
 
 #pragma pack(pop)

@@ -14,7 +14,9 @@ constexpr uint32_t FourCC(char a, char b, char c, char d) {
 }
 
 /// The same from a literal of exactly four characters: FourCC("XVID").
-constexpr uint32_t FourCC(const char (&code)[5]) { return FourCC(code[0], code[1], code[2], code[3]); }
+constexpr uint32_t FourCC(const char (&code)[5]) {
+    return FourCC(code[0], code[1], code[2], code[3]);
+}
 #endif
 
 #endif

@@ -1,5 +1,5 @@
-// The records that pass from the host's decoders through the engine to the media writer. They are packed to 4 bytes,
-// so that a 64-bit build has the 32-bit layout with its pointers widened and nothing else moved.
+// The records that pass from the host's decoders through the engine to the media writer. They are packed to 4
+// bytes, so that a 64-bit build has the 32-bit layout with its pointers widened and nothing else moved.
 #ifndef MOVIECONV_MEDIA_MEDIARECORDS_H
 #define MOVIECONV_MEDIA_MEDIARECORDS_H
 
@@ -48,21 +48,21 @@ enum {
 
 /// One decoded picture: 76 bytes in the 32-bit build, 88 in the 64-bit one.
 typedef struct VideoImage {
-    int32_t nType;             ///< kMediaTypePicture.
-    int32_t nFormat;           ///< Pixel layout, kPictureFormatPlanar420.
-    unsigned char* pY;         ///< Luma plane.
-    unsigned char* pU;         ///< Cb plane, half width and half height.
-    unsigned char* pV;         ///< Cr plane, half width and half height.
-    int32_t nReserved;         ///< Copied unchanged.
-    int32_t nWidth;            ///< Width in pixels.
-    int32_t nHeight;           ///< Height in pixels.
-    int32_t nPitchY;           ///< Bytes from one luma row to the next.
-    int32_t nPitchU;           ///< Bytes from one row of pU to the next.
-    int32_t nPitchV;           ///< Bytes from one row of pV to the next.
+    int32_t nType;              ///< kMediaTypePicture.
+    int32_t nFormat;            ///< Pixel layout, kPictureFormatPlanar420.
+    unsigned char* pY;          ///< Luma plane.
+    unsigned char* pU;          ///< Cb plane, half width and half height.
+    unsigned char* pV;          ///< Cr plane, half width and half height.
+    int32_t nReserved;          ///< Copied unchanged.
+    int32_t nWidth;             ///< Width in pixels.
+    int32_t nHeight;            ///< Height in pixels.
+    int32_t nPitchY;            ///< Bytes from one luma row to the next.
+    int32_t nPitchU;            ///< Bytes from one row of pU to the next.
+    int32_t nPitchV;            ///< Bytes from one row of pV to the next.
     unsigned char reserved[12]; ///< Copied unchanged.
-    int64_t llTime2;           ///< Second time stamp, shifted exactly as llTime is; 100 ns units.
-    int64_t llTime;            ///< Time stamp, 100 ns units; -1 when the picture has none.
-    int32_t nDuration;         ///< Duration, 100 ns units.
+    int64_t llTime2;            ///< Second time stamp, shifted exactly as llTime is; 100 ns units.
+    int64_t llTime;             ///< Time stamp, 100 ns units; -1 when the picture has none.
+    int32_t nDuration;          ///< Duration, 100 ns units.
 } VideoImage;
 
 /// One block of interleaved PCM sound: 76 bytes in the 32-bit build, 80 in the 64-bit one.
@@ -85,7 +85,9 @@ typedef struct AudioFrame {
 #ifdef __cplusplus
 namespace media_layout {
 /// Bytes that `pointers` pointers in front of a field add to its offset on a 64-bit build.
-constexpr std::size_t widened(std::size_t pointers) { return pointers * (sizeof(void*) - 4); }
+constexpr std::size_t widened(std::size_t pointers) {
+    return pointers * (sizeof(void*) - 4);
+}
 } // namespace media_layout
 
 static_assert(sizeof(VideoFormat) == 24 && offsetof(VideoFormat, dFrameRate) == 8);

@@ -56,7 +56,7 @@ struct OpaqueEventQueueRef {
                 return eventAlreadyPostedErr;
             if (size == kCapacity)
                 return eventQueueFullErr;
-            events[static_cast<std::size_t>(priority)].push_back(event);
+            events[static_cast<std::size_t>(kEventPriorityHigh - priority)].push_back(event);
             event->queued = true;
             ++size;
             RetainEvent(event);
@@ -81,14 +81,14 @@ private:
     static constexpr EventTimeout kLongestTimeout = 1e8; // seconds; what is longer may overflow the clock
 
     EventRef Take(ItemCount numTypes, const EventTypeSpec* list, bool pull) {
-        for (auto queue = events.rbegin(); queue != events.rend(); ++queue) {
-            const auto found = std::find_if(queue->begin(), queue->end(),
+        for (auto& queue : events) {
+            const auto found = std::find_if(queue.begin(), queue.end(),
                                             [=](EventRef event) { return Matches(*event, numTypes, list); });
-            if (found == queue->end())
+            if (found == queue.end())
                 continue;
             const EventRef event = *found;
             if (pull) {
-                queue->erase(found);
+                queue.erase(found);
                 event->queued = false;
                 --size;
             }
@@ -99,7 +99,7 @@ private:
 
     std::mutex mutex;
     std::condition_variable arrived;
-    std::array<std::deque<EventRef>, kEventPriorityHigh + 1> events; // by priority
+    std::array<std::deque<EventRef>, kEventPriorityHigh + 1> events; // by priority, the highest first
     std::size_t size = 0;
 };
 

@@ -30,13 +30,7 @@ unsigned LowAddress(const void* address) {
 
 } // namespace
 
-BaseThread::BaseThread()
-    : hThread(nullptr),
-      hStopEvent(nullptr),
-      hExitEvent(nullptr),
-      nPauseCount(0),
-      nState(kStateIdle),
-      joinMutex(PTHREAD_MUTEX_INITIALIZER) {
+BaseThread::BaseThread() {
     printf("ThreadEngine::ThreadEngine() [0x%x]...\r\n", LowAddress(this));
     hStopEvent = SyncCreateEvent(nullptr, 1, 1, nullptr);
     hExitEvent = SyncCreateEvent(nullptr, 1, 1, nullptr);

@@ -51,18 +51,19 @@ protected:
     /// Ends every pause.
     void ReleasePauses();
 
-    pthread_t* hThread; // guarded by joinMutex
-    SyncEvent* hStopEvent;
-    SyncEvent* hExitEvent;
-    std::atomic<int32_t> nPauseCount;
-    std::atomic<int32_t> nState;
+    pthread_t* hThread = nullptr; // guarded by joinMutex
+    SyncEvent* hStopEvent = nullptr;
+    SyncEvent* hExitEvent = nullptr;
+    std::atomic<int32_t> nPauseCount{0};
+    std::atomic<int32_t> nState{kStateIdle};
 
 private:
     int32_t ActiveState() const;
     bool StartThread();
     void Join();
 
-    pthread_mutex_t joinMutex; // held while the thread is made and while it is joined
+    pthread_mutex_t joinMutex =
+        PTHREAD_MUTEX_INITIALIZER; // held while the thread is made and while it is joined
 };
 
 #pragma GCC visibility push(default)
