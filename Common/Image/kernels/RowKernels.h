@@ -76,6 +76,8 @@ const RowKernels& BestRowKernels();
 
 /// The tables, one a file. Only RowKernelsFor says whether the processor can run them.
 extern const RowKernels kPlainKernels;
+extern const RowKernels kSse41Kernels;
+extern const RowKernels kAvx2Kernels;
 
 } // namespace image
 

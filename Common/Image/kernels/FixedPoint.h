@@ -1,0 +1,73 @@
+// The equations of PixelEquations.h in the forms that 16-bit multiplications take. Both sets, fast and
+// simple, become the same instructions with other constants. Each form is exact for every byte input.
+#ifndef MOVIECONV_COMMON_IMAGE_KERNELS_FIXEDPOINT_H
+#define MOVIECONV_COMMON_IMAGE_KERNELS_FIXEDPOINT_H
+
+#include <cstdint>
+
+namespace image {
+
+/// RGB to YUV. A sum is scaled by 2^16 / 2^kBits, so that the result is the upper half of a 32-bit lane,
+/// rounded toward minus infinity: no shift, and nothing of the fraction left to carry. Red and blue are
+/// weighted as one pair of words, green as a pair of equal words, because its scaled weight alone would not
+/// fit 16 bits.
+///   Y - 16 = (blue * B + red * R + green * G + green * G + rounding) >> 16, and so on.
+/// The weights of U add up to 0, so U needs only B - G and R - G. Those of V add up to kCrSum, so that times
+/// G is missing.
+template <int kBitsOfSet, int kYRed, int kYGreen, int kYBlue, int kCbRed, int kCbGreen, int kCbBlue,
+          int kCrRed, int kCrGreen, int kCrBlue, int kRoundingOfSet>
+struct RgbToYuvForm {
+    static constexpr int kScale = 1 << (16 - kBitsOfSet);
+    static constexpr int kYBlueWeight = kYBlue * kScale;
+    static constexpr int kYRedWeight = kYRed * kScale;
+    static constexpr int kYGreenWeight = kYGreen * kScale / 2;
+    static constexpr int kCbBlueWeight = kCbBlue * kScale;
+    static constexpr int kCbRedWeight = kCbRed * kScale;
+    static constexpr int kCrBlueWeight = kCrBlue * kScale;
+    static constexpr int kCrRedWeight = kCrRed * kScale;
+    static constexpr int kCrSum = (kCrRed + kCrGreen + kCrBlue) * kScale;
+    static constexpr int kRounding = kRoundingOfSet * kScale;
+
+    static_assert(kCbRed + kCbGreen + kCbBlue == 0);
+    static_assert(kYGreenWeight <= INT16_MAX && kYRedWeight <= INT16_MAX && kCbBlueWeight <= INT16_MAX);
+    static_assert(kCrRedWeight <= INT16_MAX);
+};
+
+using FastRgbForm = RgbToYuvForm<14, 4211, 8258, 1606, -2425, -4768, 7193, 7193, -6029, -1163, 0>;
+using SimpleRgbForm = RgbToYuvForm<10, 263, 516, 100, -152, -298, 450, 450, -377, -73, 512>;
+
+/// YUV to RGB in 16-bit lanes: component = clamp((luma + chroma) >> 7) with
+///   luma = 149 * Y - kBias and chroma = the term of the equation >> (its bits - 7), + kBias.
+/// The sum may leave 16 bits only where the clamp gives the same as a saturated sum. That holds for red and
+/// green for every bias from 5228 to 9147. The term of blue does not fit 16 bits: it is split into (U - 128)
+/// * 256, which is added first, and the rest, which is never negative. A term factor * x + offset, to be
+/// shifted right by s, is (factor >> s) * x + (offset >> s) + (the remainders >> s).
+template <int kBitsOfSet, int kLumaOfSet, int kRedV, int kRedOffset, int kGreenU, int kGreenV,
+          int kGreenOffset, int kBlueU, int kBlueOffset>
+struct YuvToRgbForm {
+    static constexpr int kShift = kBitsOfSet - 7;
+    static constexpr int kLumaWeight = 149;
+    static constexpr int kLumaConstant = 100; // times 127, see kBias
+    static constexpr int kBias = 128 * kLumaWeight - 127 * kLumaConstant;
+    static_assert(kLumaOfSet == kLumaWeight << kShift && kBias >= 5228 && kBias <= 9147);
+
+    static constexpr int Whole(int value) { return value >> kShift; }
+    static constexpr int Rest(int value) { return value & ((1 << kShift) - 1); }
+
+    static constexpr int kRedWhole = Whole(kRedV), kRedRest = Rest(kRedV);
+    static constexpr int kRedConstant = Whole(kRedOffset) + kBias, kRedRestConstant = Rest(kRedOffset);
+    static constexpr int kGreenUWhole = Whole(kGreenU), kGreenURest = Rest(kGreenU);
+    static constexpr int kGreenVWhole = Whole(kGreenV), kGreenVRest = Rest(kGreenV);
+    static constexpr int kGreenConstant = Whole(kGreenOffset) + kBias,
+                         kGreenRestConstant = Rest(kGreenOffset);
+    static constexpr int kBlueWhole = Whole(kBlueU) - 256, kBlueRest = Rest(kBlueU);
+    static constexpr int kBlueConstant = Whole(kBlueOffset) + 128 * 256 + kBias,
+                         kBlueRestConstant = Rest(kBlueOffset);
+};
+
+using FastYuvForm = YuvToRgbForm<13, 9536, 13074, -1826095, -3203, -6660, 1109918, 16532, -2268594>;
+using SimpleYuvForm = YuvToRgbForm<10, 1192, 1634, -227712, -401, -833, 139392, 2065, -282880>;
+
+} // namespace image
+
+#endif

@@ -1,0 +1,96 @@
+// AVX2: two lanes.
+#include "Common/Image/kernels/LaneKernels.h"
+
+#include <immintrin.h>
+
+namespace image {
+namespace {
+
+struct Avx2 {
+    using Vec = __m256i;
+
+    static const RowKernels& Lower() { return kSse41Kernels; }
+
+    static __m128i LoadLane(const uint8_t* p) { return _mm_loadu_si128(reinterpret_cast<const __m128i*>(p)); }
+    static void StoreLane(uint8_t* p, __m128i a) { _mm_storeu_si128(reinterpret_cast<__m128i*>(p), a); }
+
+    static Vec Load(const uint8_t* p) { return _mm256_loadu_si256(reinterpret_cast<const Vec*>(p)); }
+    static Vec LoadLanes(const uint8_t* p, ptrdiff_t distance) {
+        return _mm256_inserti128_si256(_mm256_castsi128_si256(LoadLane(p)), LoadLane(p + distance), 1);
+    }
+    static Vec LoadWords(const uint8_t* p) { return _mm256_cvtepu8_epi16(LoadLane(p)); }
+    static void Store(uint8_t* p, Vec a) { _mm256_storeu_si256(reinterpret_cast<Vec*>(p), a); }
+    static void StoreLanes(uint8_t* p, ptrdiff_t distance, Vec a) {
+        StoreLane(p, _mm256_castsi256_si128(a));
+        StoreLane(p + distance, _mm256_extracti128_si256(a, 1));
+    }
+    static void StoreHalves(uint8_t* low, uint8_t* high, Vec a) {
+        const Vec halves = _mm256_permute4x64_epi64(a, _MM_SHUFFLE(3, 1, 2, 0));
+        StoreLane(low, _mm256_castsi256_si128(halves));
+        StoreLane(high, _mm256_extracti128_si256(halves, 1));
+    }
+
+    static Vec Lane(const LaneBytes& bytes) {
+        return _mm256_broadcastsi128_si256(LoadLane(reinterpret_cast<const uint8_t*>(bytes.data())));
+    }
+    static Vec Set8(int value) { return _mm256_set1_epi8(static_cast<char>(value)); }
+    static Vec Set16(int value) { return _mm256_set1_epi16(static_cast<int16_t>(value)); }
+    static Vec Set32(int32_t value) { return _mm256_set1_epi32(value); }
+    static Vec SetPair(int low, int high) {
+        return Set32((low & 0xFFFF) | static_cast<int>(static_cast<unsigned>(high) << 16));
+    }
+
+    static Vec And(Vec a, Vec b) { return _mm256_and_si256(a, b); }
+    static Vec Or(Vec a, Vec b) { return _mm256_or_si256(a, b); }
+    static Vec Xor(Vec a, Vec b) { return _mm256_xor_si256(a, b); }
+    static Vec Add8(Vec a, Vec b) { return _mm256_add_epi8(a, b); }
+    static Vec Add16(Vec a, Vec b) { return _mm256_add_epi16(a, b); }
+    static Vec AddSat16(Vec a, Vec b) { return _mm256_adds_epi16(a, b); }
+    static Vec Sub16(Vec a, Vec b) { return _mm256_sub_epi16(a, b); }
+    static Vec Add32(Vec a, Vec b) { return _mm256_add_epi32(a, b); }
+    static Vec Mul16(Vec a, Vec b) { return _mm256_mullo_epi16(a, b); }
+    static Vec MulAdd16(Vec a, Vec b) { return _mm256_madd_epi16(a, b); }
+    static Vec MulAddU8S8(Vec a, Vec b) { return _mm256_maddubs_epi16(a, b); }
+    static Vec PackUs16(Vec a, Vec b) { return _mm256_packus_epi16(a, b); }
+    static Vec Shuffle8(Vec a, Vec indices) { return _mm256_shuffle_epi8(a, indices); }
+    static Vec UnpackLo8(Vec a, Vec b) { return _mm256_unpacklo_epi8(a, b); }
+    static Vec UnpackHi8(Vec a, Vec b) { return _mm256_unpackhi_epi8(a, b); }
+    static Vec UnpackLo16(Vec a, Vec b) { return _mm256_unpacklo_epi16(a, b); }
+    static Vec UnpackHi16(Vec a, Vec b) { return _mm256_unpackhi_epi16(a, b); }
+    static Vec Blend8(Vec a, Vec b, Vec mask) { return _mm256_blendv_epi8(a, b, mask); }
+
+    template <int kMask>
+    static Vec Blend16(Vec a, Vec b) {
+        return _mm256_blend_epi16(a, b, kMask);
+    }
+    template <int kBits>
+    static Vec Sll16(Vec a) {
+        return _mm256_slli_epi16(a, kBits);
+    }
+    template <int kBits>
+    static Vec Srl16(Vec a) {
+        return _mm256_srli_epi16(a, kBits);
+    }
+    template <int kBits>
+    static Vec Sra16(Vec a) {
+        return _mm256_srai_epi16(a, kBits);
+    }
+    template <int kBits>
+    static Vec Srl32(Vec a) {
+        return _mm256_srli_epi32(a, kBits);
+    }
+    template <int kBits>
+    static Vec Sll64(Vec a) {
+        return _mm256_slli_epi64(a, kBits);
+    }
+    template <int kBits>
+    static Vec Srl64(Vec a) {
+        return _mm256_srli_epi64(a, kBits);
+    }
+};
+
+} // namespace
+
+constinit const RowKernels kAvx2Kernels = LaneKernels<Avx2>::Table();
+
+} // namespace image
