@@ -128,8 +128,8 @@ int MWGetFileCount(void);
 /// file is not known (any more) or `status` is null.
 int MWGetFileStatus(int sequence, WriterStatus* status);
 
-/// Copies the latest status that carries an error. Returns 1; 0 when no file has failed yet or `status` is
-/// null.
+/// Copies the latest remembered status that carries an error. Returns 1; 0 when no file has failed yet or
+/// `status` is null.
 int MWGetLastFailure(WriterStatus* status);
 
 #pragma GCC visibility pop

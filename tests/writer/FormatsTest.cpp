@@ -1,0 +1,96 @@
+// Every format with every codec that the table says it carries: written, then read back and decoded.
+#include "MovieReader.h"
+#include "TestSource.h"
+#include "writer/FormatTable.h"
+#include "writer/WriterStatus.h"
+
+#include <gtest/gtest.h>
+
+#include <cmath>
+#include <string>
+#include <vector>
+
+namespace {
+
+struct Pair {
+    uint32_t format;
+    uint32_t video; ///< 0: none.
+    uint32_t audio; ///< 0: none.
+};
+
+std::string Name(const testing::TestParamInfo<Pair>& info) {
+    std::string name;
+    for (const uint32_t code : {info.param.format, info.param.video, info.param.audio}) {
+        for (const char character : code == 0 ? std::string("none") : writer::CodeText(code)) {
+            if (character != ' ')
+                name += character;
+        }
+        name += '_';
+    }
+    name.pop_back();
+    return name;
+}
+
+/// Each codec of each format once, with the default of the other kind.
+std::vector<Pair> AllPairs() {
+    std::vector<Pair> pairs;
+    for (const FileFormatInfo* info = MWGetFileFormatInfos(); info->fccFormat != 0; ++info) {
+        for (const uint32_t* video = info->fccVideoCodecs; *video != 0; ++video)
+            pairs.push_back({info->fccFormat, *video, info->fccAudioCodecs[0]});
+        for (const uint32_t* audio = info->fccAudioCodecs + (info->bHasVideo != 0 ? 1 : 0); *audio != 0;
+             ++audio)
+            pairs.push_back({info->fccFormat, info->fccVideoCodecs[0], *audio});
+    }
+    return pairs;
+}
+
+class Formats : public testing::TestWithParam<Pair> {};
+
+TEST_P(Formats, AreReadBackComplete) {
+    const Pair pair = GetParam();
+    const TemporaryFolder folder;
+    TestMovie movie;
+    movie.pictures = 30;
+    movie.soundSeconds = 1.2;
+    movie.param.fccFileFormat = pair.format;
+    movie.param.fccVideo = pair.video;
+    movie.param.fccAudio = pair.audio;
+    movie.hasVideo = pair.video != 0;
+    const std::string path = folder.Path("movie");
+    WriterStatus status{};
+    ASSERT_TRUE(movie.Write(path)) << (MWGetLastFailure(&status), status.szWhat);
+    EXPECT_EQ(folder.Names(), std::vector<std::string>{"movie"});
+
+    const writer::Container* container = writer::FindContainer(pair.format);
+    const writer::AudioCodec* audio = writer::FindAudioCodec(*container, pair.audio);
+    const ReadMovie read = ReadMovieFile(path);
+    EXPECT_TRUE(read.readable);
+    EXPECT_EQ(read.audioStreams, 1);
+    EXPECT_EQ(read.audioCodec, audio->id);
+    EXPECT_EQ(read.channels, 2);
+    // The decoder may hear the run-up and the padding of the codec's frames, nothing else.
+    const double heard = static_cast<double>(read.samples) / read.sampleRate;
+    EXPECT_NEAR(heard, 1.2, 0.09);
+    EXPECT_GE(heard, 1.2 - 0.0001);
+    if (movie.hasVideo) {
+        const writer::VideoCodec* video = writer::FindVideoCodec(*container, pair.video);
+        EXPECT_EQ(read.videoStreams, 1);
+        EXPECT_EQ(read.videoCodec, video->id);
+        ASSERT_EQ(read.pictures.size(), 30U);
+        const double start = read.pictures.front().time;
+        for (size_t i = 0; i < read.pictures.size(); ++i)
+            ASSERT_NEAR(read.pictures[i].time - start, static_cast<double>(i) / 25.0, 0.0011) << i;
+        EXPECT_NEAR(read.audioStart, start, 0.04);
+        EXPECT_NEAR(read.duration, 1.2, 0.1);
+    }
+
+    ASSERT_EQ(MWGetFileStatus(MWGetFileCount(), &status), 1);
+    EXPECT_EQ(status.nState, kWriterFileComplete);
+    EXPECT_NEAR(status.dAudioWritten, 1.2, 0.0001);
+    EXPECT_NEAR(status.dVideoWritten, movie.hasVideo ? 1.2 : 0.0, 0.0001);
+    EXPECT_EQ(status.llPicturesWritten, movie.hasVideo ? 30 : 0);
+}
+
+INSTANTIATE_TEST_SUITE_P(All, Formats, testing::ValuesIn(AllPairs()), Name);
+
+} // namespace

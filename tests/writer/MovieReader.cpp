@@ -1,0 +1,123 @@
+#include "MovieReader.h"
+
+extern "C" {
+#include <libavutil/imgutils.h>
+}
+
+#include <functional>
+#include <map>
+
+namespace {
+
+void TakePicture(const AVFrame& frame, AVRational unit, ReadMovie& movie) {
+    ReadPicture picture;
+    // Containers without stamps leave the last picture of some codecs without one.
+    picture.time = frame.best_effort_timestamp == AV_NOPTS_VALUE && movie.pictures.size() > 1
+                       ? 2 * movie.pictures.back().time - movie.pictures[movie.pictures.size() - 2].time
+                       : static_cast<double>(frame.best_effort_timestamp) * av_q2d(unit);
+    picture.width = frame.width;
+    picture.height = frame.height;
+    picture.luma.resize(static_cast<size_t>(frame.width) * frame.height);
+    av_image_copy_plane(picture.luma.data(), frame.width, frame.data[0], frame.linesize[0], frame.width,
+                        frame.height);
+    movie.pictures.push_back(std::move(picture));
+}
+
+float SampleAt(const AVFrame& frame, int index) {
+    const int stride = av_sample_fmt_is_planar(static_cast<AVSampleFormat>(frame.format)) != 0
+                           ? 1
+                           : frame.ch_layout.nb_channels;
+    const uint8_t* data = frame.extended_data[0];
+    const auto at = static_cast<size_t>(index) * stride;
+    switch (av_get_packed_sample_fmt(static_cast<AVSampleFormat>(frame.format))) {
+    case AV_SAMPLE_FMT_U8:
+        return static_cast<float>(data[at] - 128) / 128.0F;
+    case AV_SAMPLE_FMT_S16:
+        return static_cast<float>(reinterpret_cast<const int16_t*>(data)[at]) / 32768.0F;
+    case AV_SAMPLE_FMT_S32:
+        return static_cast<float>(reinterpret_cast<const int32_t*>(data)[at]) / 2147483648.0F;
+    case AV_SAMPLE_FMT_FLT:
+        return reinterpret_cast<const float*>(data)[at];
+    default:
+        return 0;
+    }
+}
+
+void TakeSound(const AVFrame& frame, AVRational unit, ReadMovie& movie) {
+    if (movie.samples == 0)
+        movie.audioStart = static_cast<double>(frame.best_effort_timestamp) * av_q2d(unit);
+    for (int i = 0; i < frame.nb_samples; ++i)
+        movie.firstChannel.push_back(SampleAt(frame, i));
+    movie.samples += frame.nb_samples;
+}
+
+av::CodecContext OpenDecoder(const AVStream& stream) {
+    const AVCodec* codec = avcodec_find_decoder(stream.codecpar->codec_id);
+    av::CodecContext context(avcodec_alloc_context3(codec));
+    avcodec_parameters_to_context(context.get(), stream.codecpar);
+    context->pkt_timebase = stream.time_base;
+    context->thread_count = 1;
+    return avcodec_open2(context.get(), codec, nullptr) < 0 ? nullptr : std::move(context);
+}
+
+void Describe(AVFormatContext& input, AVStream& stream, ReadMovie& movie) {
+    const AVCodecParameters& parameters = *stream.codecpar;
+    if (parameters.codec_type == AVMEDIA_TYPE_VIDEO) {
+        ++movie.videoStreams;
+        movie.videoCodec = parameters.codec_id;
+        movie.sampleAspect = av_guess_sample_aspect_ratio(&input, &stream, nullptr);
+        movie.frameRate = stream.avg_frame_rate;
+    } else if (parameters.codec_type == AVMEDIA_TYPE_AUDIO) {
+        ++movie.audioStreams;
+        movie.audioCodec = parameters.codec_id;
+        movie.sampleRate = parameters.sample_rate;
+        movie.channels = parameters.ch_layout.nb_channels;
+    }
+}
+
+bool Decode(AVCodecContext& decoder, AVPacket* packet, const std::function<void(const AVFrame&)>& take) {
+    if (avcodec_send_packet(&decoder, packet) < 0)
+        return false;
+    const av::Frame frame(av_frame_alloc());
+    int result = 0;
+    while ((result = avcodec_receive_frame(&decoder, frame.get())) >= 0)
+        take(*frame);
+    return result == AVERROR(EAGAIN) || result == AVERROR_EOF;
+}
+
+} // namespace
+
+ReadMovie ReadMovieFile(const std::string& path) {
+    av_log_set_level(AV_LOG_FATAL);
+    ReadMovie movie;
+    AVFormatContext* context = nullptr;
+    if (avformat_open_input(&context, ("file:" + path).c_str(), nullptr, nullptr) < 0)
+        return movie;
+    const av::Input input(context);
+    if (avformat_find_stream_info(context, nullptr) < 0)
+        return movie;
+    movie.format = context->iformat->name;
+    movie.duration = static_cast<double>(context->duration) / AV_TIME_BASE;
+    std::map<int, av::CodecContext> decoders;
+    for (unsigned i = 0; i < context->nb_streams; ++i) {
+        Describe(*context, *context->streams[i], movie);
+        decoders[static_cast<int>(i)] = OpenDecoder(*context->streams[i]);
+    }
+    movie.readable = true;
+    const auto decode = [&](int index, AVPacket* packet) {
+        const AVRational unit = context->streams[index]->time_base;
+        const bool video = context->streams[index]->codecpar->codec_type == AVMEDIA_TYPE_VIDEO;
+        const auto take = [&](const AVFrame& frame) {
+            video ? TakePicture(frame, unit, movie) : TakeSound(frame, unit, movie);
+        };
+        movie.readable = movie.readable && decoders[index] && Decode(*decoders[index], packet, take);
+    };
+    const av::Packet packet(av_packet_alloc());
+    while (av_read_frame(context, packet.get()) >= 0) {
+        decode(packet->stream_index, packet.get());
+        av_packet_unref(packet.get());
+    }
+    for (const auto& entry : decoders)
+        decode(entry.first, nullptr);
+    return movie;
+}

@@ -1,0 +1,46 @@
+// Reads a movie with FFmpeg's libraries and says what is in it.
+#ifndef MOVIECONV_TESTS_WRITER_MOVIEREADER_H
+#define MOVIECONV_TESTS_WRITER_MOVIEREADER_H
+
+#include "ffmpeg/AvHandles.h"
+
+#include <cstdint>
+#include <string>
+#include <vector>
+
+/// One decoded picture.
+struct ReadPicture {
+    double time = 0; ///< Seconds.
+    int width = 0;
+    int height = 0;
+    std::vector<uint8_t> luma; ///< Rows without padding.
+
+    int At(int x, int y) const { return luma[static_cast<size_t>(y) * width + x]; }
+};
+
+/// One decoded movie. Streams that are missing leave their fields as they are.
+struct ReadMovie {
+    bool readable = false;
+    std::string format;
+    double duration = 0; ///< Seconds, as the container says.
+
+    int videoStreams = 0;
+    AVCodecID videoCodec = AV_CODEC_ID_NONE;
+    AVRational sampleAspect{0, 1};
+    AVRational frameRate{0, 1};
+    std::vector<ReadPicture> pictures;
+
+    int audioStreams = 0;
+    AVCodecID audioCodec = AV_CODEC_ID_NONE;
+    int sampleRate = 0;
+    int channels = 0;
+    double audioStart = 0;           ///< Seconds; time of the first sample that is heard.
+    int64_t samples = 0;             ///< Sample frames decoded.
+    std::vector<float> firstChannel; ///< Decoded samples, -1 to 1.
+};
+
+/// Decodes everything in `path`. `readable` is false when the file cannot be opened or its data ends in
+/// errors.
+ReadMovie ReadMovieFile(const std::string& path);
+
+#endif

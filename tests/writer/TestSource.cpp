@@ -1,0 +1,147 @@
+#include "TestSource.h"
+
+#include "text/Utf8.h"
+
+#include <algorithm>
+#include <cmath>
+#include <cstring>
+#include <filesystem>
+#include <stdexcept>
+
+#include <stdlib.h>
+
+namespace {
+
+constexpr int64_t kSecond = 10'000'000;
+
+} // namespace
+
+TemporaryFolder::TemporaryFolder() {
+    std::string name = (std::filesystem::temp_directory_path() / "writer-test-XXXXXX").string();
+    if (mkdtemp(name.data()) == nullptr)
+        throw std::runtime_error("no temporary folder");
+    path_ = name;
+}
+
+TemporaryFolder::~TemporaryFolder() {
+    std::error_code ignored;
+    std::filesystem::remove_all(path_, ignored);
+}
+
+std::vector<std::string> TemporaryFolder::Names() const {
+    std::vector<std::string> names;
+    for (const auto& entry : std::filesystem::directory_iterator(path_))
+        names.push_back(entry.path().filename().string());
+    std::sort(names.begin(), names.end());
+    return names;
+}
+
+TestPicture::TestPicture(int width, int height, int pitchExtra) {
+    const int chroma_width = (width + 1) / 2;
+    const int chroma_height = (height + 1) / 2;
+    image_.nType = kMediaTypePicture;
+    image_.nFormat = kPictureFormatPlanar420;
+    image_.nWidth = width;
+    image_.nHeight = height;
+    image_.nPitchY = width + pitchExtra;
+    image_.nPitchU = chroma_width + pitchExtra;
+    image_.nPitchV = chroma_width + 2 * pitchExtra;
+    planes_[0].assign(static_cast<size_t>(image_.nPitchY) * height, 255);
+    planes_[1].assign(static_cast<size_t>(image_.nPitchU) * chroma_height, 255);
+    planes_[2].assign(static_cast<size_t>(image_.nPitchV) * chroma_height, 255);
+    for (int row = 0; row < chroma_height; ++row) {
+        std::memset(&planes_[1][static_cast<size_t>(row) * image_.nPitchU], 120, chroma_width);
+        std::memset(&planes_[2][static_cast<size_t>(row) * image_.nPitchV], 136, chroma_width);
+    }
+    image_.pY = planes_[0].data();
+    image_.pU = planes_[1].data();
+    image_.pV = planes_[2].data();
+}
+
+const VideoImage& TestPicture::Paint(int number, int64_t time) {
+    for (int y = 0; y < image_.nHeight; ++y) {
+        unsigned char* row = image_.pY + static_cast<ptrdiff_t>(y) * image_.nPitchY;
+        for (int x = 0; x < image_.nWidth; ++x)
+            row[x] = static_cast<unsigned char>(40 + (x + y) / 4 % 60);
+    }
+    const int block = std::max(1, image_.nWidth / 10);
+    for (int y = 0; y < image_.nHeight / 2; ++y)
+        std::memset(image_.pY + static_cast<ptrdiff_t>(y) * image_.nPitchY + number % 10 * block, 220, block);
+    image_.llTime = image_.llTime2 = time;
+    return image_;
+}
+
+TestSound::TestSound(int rate, int channels, int bits, double frequency) : frequency_(frequency) {
+    frame_.nType = 2;
+    frame_.nSampleRate = rate;
+    frame_.nChannels = channels;
+    frame_.nBitsPerSample = bits;
+}
+
+const AudioFrame& TestSound::Next(int samples, int64_t time) {
+    const int size = frame_.nBitsPerSample / 8;
+    data_.clear();
+    for (int i = 0; i < samples; ++i, ++position_) {
+        const double value = 0.5 * std::sin(2 * M_PI * frequency_ * position_ / frame_.nSampleRate);
+        auto wide = static_cast<int32_t>(std::lround(value * 2147483647.0));
+        if (size == 1)
+            wide ^= INT32_MIN;
+        for (int channel = 0; channel < frame_.nChannels; ++channel) {
+            for (int byte = 4 - size; byte < 4; ++byte)
+                data_.push_back(static_cast<unsigned char>(static_cast<uint32_t>(wide) >> (8 * byte)));
+        }
+    }
+    frame_.pData = data_.data();
+    frame_.nLength = frame_.nBufferSize = static_cast<int32_t>(data_.size());
+    frame_.llTime = frame_.llTime2 = time;
+    frame_.nDuration = static_cast<int32_t>(kSecond * samples / frame_.nSampleRate);
+    return frame_;
+}
+
+EncodeParam TestMovie::Param() {
+    EncodeParam param{};
+    param.fccVideo = FourCC("XVID");
+    param.fccColorFormat = FourCC("YV12");
+    param.nBitCount = 12;
+    param.nVideoBitrate = 512000;
+    param.fccAudio = FourCC("AAC ");
+    param.nBitsPerSample = 16;
+    param.nAudioBitrate = 128000;
+    param.fccFileFormat = FourCC("MP4 ");
+    return param;
+}
+
+void* TestMovie::Create(const std::string& path) const {
+    const VideoFormat video = Video();
+    const AudioFormat audio = Audio();
+    return MWCreateMediaFile(text::FromUtf8(path).c_str(), &param, hasVideo ? &video : nullptr,
+                             hasAudio ? &audio : nullptr);
+}
+
+void TestMovie::WriteAll(void* file) const {
+    TestPicture picture(width, height, pitchExtra);
+    TestSound sound(sampleRate, channels, bits);
+    const auto samples = static_cast<int64_t>(soundSeconds * sampleRate + 0.5);
+    int64_t written = 0;
+    const auto write_sound = [&](int64_t until) {
+        while (hasAudio && written < samples && written * kSecond / sampleRate <= until) {
+            const int count = static_cast<int>(std::min<int64_t>(512, samples - written));
+            MWWriteAudioData(file, &sound.Next(count, written * kSecond / sampleRate));
+            written += count;
+        }
+    };
+    for (int number = 0; hasVideo && number < pictures; ++number) {
+        const auto time = static_cast<int64_t>(std::llround(number * kSecond / rate));
+        write_sound(time);
+        MWWriteVideoFrame(file, &picture.Paint(number, time));
+    }
+    write_sound(INT64_MAX);
+}
+
+bool TestMovie::Write(const std::string& path) const {
+    void* file = Create(path);
+    if (file == nullptr)
+        return false;
+    WriteAll(file);
+    return MWCloseMediaFile(file, nullptr, nullptr) != 0;
+}

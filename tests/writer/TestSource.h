@@ -1,0 +1,92 @@
+// Pictures, sound and parameters for tests of the writer.
+#ifndef MOVIECONV_TESTS_WRITER_TESTSOURCE_H
+#define MOVIECONV_TESTS_WRITER_TESTSOURCE_H
+
+#include "media/EncodeParam.h"
+#include "media/FourCC.h"
+#include "media/MediaRecords.h"
+#include "media/MediaWriter.h"
+
+#include <cstdint>
+#include <string>
+#include <vector>
+
+/// A folder that goes away with all that is in it.
+class TemporaryFolder {
+public:
+    TemporaryFolder();
+    TemporaryFolder(const TemporaryFolder&) = delete;
+    TemporaryFolder& operator=(const TemporaryFolder&) = delete;
+    ~TemporaryFolder();
+
+    std::string Path(const std::string& name) const { return path_ + "/" + name; }
+    const std::string& Path() const { return path_; }
+    /// Names of what is in it, sorted.
+    std::vector<std::string> Names() const;
+
+private:
+    std::string path_;
+};
+
+/// One picture: a moving ramp with a bright block whose place tells the picture's number.
+class TestPicture {
+public:
+    /// `pitchExtra` bytes follow every row; they hold bytes that must never be seen.
+    TestPicture(int width, int height, int pitchExtra = 0);
+
+    /// Paints picture `number` and stamps it; `time` in 100 ns units.
+    const VideoImage& Paint(int number, int64_t time);
+
+private:
+    std::vector<unsigned char> planes_[3];
+    VideoImage image_{};
+};
+
+/// A tone in blocks.
+class TestSound {
+public:
+    TestSound(int rate, int channels, int bits, double frequency = 440.0);
+
+    /// The next `samples` sample frames, stamped `time`.
+    const AudioFrame& Next(int samples, int64_t time);
+
+private:
+    std::vector<unsigned char> data_;
+    AudioFrame frame_{};
+    double frequency_;
+    int64_t position_ = 0;
+};
+
+/// What a test writes, with the defaults of most tests.
+struct TestMovie {
+    int width = 160;
+    int height = 120;
+    double rate = 25.0;
+    int pictures = 50;
+    int pitchExtra = 0;
+    int sampleRate = 44100;
+    int channels = 2;
+    int bits = 16;
+    double soundSeconds = 2.0;
+    EncodeParam param = Param();
+    bool hasVideo = true;
+    bool hasAudio = true;
+
+    static EncodeParam Param();
+
+    VideoFormat Video() const { return {width, height, rate, pictures / rate}; }
+    AudioFormat Audio() const {
+        return {sampleRate, channels, bits, sampleRate * channels * bits / 8, soundSeconds};
+    }
+
+    /// Creates the file; null when the writer refuses.
+    void* Create(const std::string& path) const;
+
+    /// Writes everything in the order of the engine: sound up to a picture's time, then the picture.
+    void WriteAll(void* file) const;
+
+    /// Creates, writes and closes; true when the writer says that the file is complete.
+    bool Write(const std::string& path) const;
+};
+
+#endif

@@ -1,0 +1,158 @@
+#include "writer/FilePlan.h"
+
+#include "writer/MediaTime.h"
+#include "writer/WriterFailure.h"
+
+extern "C" {
+#include <libavutil/imgutils.h>
+}
+
+#include <algorithm>
+#include <cmath>
+#include <string>
+#include <thread>
+
+namespace writer {
+namespace {
+
+constexpr int kDefaultVideoBitrate = 512'000;
+constexpr int kDefaultAudioBitrate = 128'000;
+constexpr double kDefaultFrameRate = 25.0;
+constexpr double kMostFrameRate = 1000.0;
+constexpr unsigned kMostThreads = 8;
+
+/// The first value that is above 0, else `last`.
+template <typename Number>
+Number FirstPositive(Number first, Number second, Number last) {
+    return first > 0 ? first : second > 0 ? second : last;
+}
+
+double UsableRate(double rate) {
+    return std::isfinite(rate) && rate > 0.0 ? std::min(rate, kMostFrameRate) : 0.0;
+}
+
+bool SameRate(double one, double other) {
+    return std::abs(one - other) <= 0.001 * other;
+}
+
+int ChooseThreads(const VideoCodec& codec, const WriterOptions& options) {
+    if (options.nEncoderThreads > 0)
+        return options.nEncoderThreads;
+    return codec.parallel
+               ? static_cast<int>(std::clamp(std::thread::hardware_concurrency(), 1U, kMostThreads))
+               : 1;
+}
+
+/// An ISO/IEC 23091-2 code as FFmpeg's enumerations, which have the same values; 2 is "not stated" in all of
+/// them.
+template <typename Enumeration>
+Enumeration ColorCode(int code, int end) {
+    return static_cast<Enumeration>(code > 0 && code < end ? code : 2);
+}
+
+std::string FormatText(const EncodeParam& param) {
+    return "\"" + CodeText(param.fccFileFormat) + "\"";
+}
+
+VideoSettings MakeVideoSettings(const EncodeParam& param, const VideoFormat& source, const VideoCodec& codec,
+                                const WriterOptions& options) {
+    VideoSettings settings{};
+    settings.width = FirstPositive(param.nWidth, source.nWidth, 0);
+    settings.height = FirstPositive(param.nHeight, source.nHeight, 0);
+    if (param.nWidth < 0 || param.nHeight < 0 ||
+        av_image_check_size(static_cast<unsigned>(settings.width), static_cast<unsigned>(settings.height), 0,
+                            nullptr) < 0)
+        throw WriterFailure(kWriterErrorArgument, "Pictures of " + std::to_string(settings.width) + "x" +
+                                                      std::to_string(settings.height) +
+                                                      " cannot be written.");
+    settings.rate = ExactRate(
+        FirstPositive(UsableRate(param.dFrameRate), UsableRate(source.dFrameRate), kDefaultFrameRate));
+    settings.bitrate = FirstPositive(param.nVideoBitrate, kDefaultVideoBitrate, 0);
+    settings.maxBitrate = param.nVideoRateMode != 0 ? std::max(0, param.nVideoMaxBitrate) : 0;
+    settings.threads = ChooseThreads(codec, options);
+    settings.primaries = ColorCode<AVColorPrimaries>(options.nColorPrimaries, AVCOL_PRI_NB);
+    settings.transfer = ColorCode<AVColorTransferCharacteristic>(options.nColorTransfer, AVCOL_TRC_NB);
+    settings.matrix = ColorCode<AVColorSpace>(options.nColorMatrix, AVCOL_SPC_NB);
+    return settings;
+}
+
+VideoPlan MakeVideoPlan(const EncodeParam& param, const VideoFormat& source, const Container& container,
+                        const WriterOptions& options) {
+    VideoPlan plan{};
+    plan.codec = FindVideoCodec(container, param.fccVideo);
+    if (plan.codec == nullptr)
+        throw WriterFailure(kWriterErrorCodec, "The format " + FormatText(param) + " cannot carry video \"" +
+                                                   CodeText(param.fccVideo) + "\".");
+    plan.settings = MakeVideoSettings(param, source, *plan.codec, options);
+    plan.sourceAspect = {options.nSampleAspectNum, options.nSampleAspectDen};
+    if (plan.sourceAspect.num <= 0 || plan.sourceAspect.den <= 0)
+        plan.sourceAspect = {1, 1};
+    plan.sourceFullRange = options.bFullRange != 0;
+    plan.stretch = param.bResize != 0;
+    const int width = plan.settings.width;
+    const int height = plan.settings.height;
+    if (source.nWidth > 0 && source.nHeight > 0)
+        plan.settings.sampleAspect =
+            FitPicture(source.nWidth, source.nHeight, plan.sourceAspect, width, height, plan.stretch)
+                .sampleAspect;
+    plan.picture = {width, height, 0, 0, AV_PIX_FMT_YUV420P, plan.sourceFullRange};
+    if (plan.codec->evenSize) {
+        plan.picture.padWidth = width % 2;
+        plan.picture.padHeight = height % 2;
+        plan.settings.width += plan.picture.padWidth;
+        plan.settings.height += plan.picture.padHeight;
+    }
+    if (plan.codec->fullRange) {
+        plan.picture.format = AV_PIX_FMT_YUVJ420P;
+        plan.picture.fullRange = true;
+    }
+    plan.settings.fullRange = plan.picture.fullRange;
+    plan.settings.inOrder = container.kind == ContainerKind::kSteadyRate;
+    plan.clock = MakePictureClock(plan.settings.rate, container.kind == ContainerKind::kSteadyRate);
+    const double source_rate = UsableRate(source.dFrameRate);
+    const double rate = av_q2d(plan.settings.rate);
+    plan.keepStamps = source_rate > 0.0 && SameRate(rate, source_rate);
+    plan.pictureLength =
+        std::llround(static_cast<double>(kUnitsPerSecond) / (source_rate > 0.0 ? source_rate : rate));
+    return plan;
+}
+
+AudioPlan MakeAudioPlan(const EncodeParam& param, const AudioFormat& source, const Container& container) {
+    AudioPlan plan{};
+    plan.codec = FindAudioCodec(container, param.fccAudio);
+    if (plan.codec == nullptr)
+        throw WriterFailure(kWriterErrorCodec, "The format " + FormatText(param) + " cannot carry audio \"" +
+                                                   CodeText(param.fccAudio) + "\".");
+    plan.settings.sampleRate = FirstPositive(param.nSampleRate, source.nSampleRate, 0);
+    plan.settings.channels = FirstPositive(param.nChannels, source.nChannels, 0);
+    plan.settings.bitsPerSample = FirstPositive(param.nBitsPerSample, source.nBitsPerSample, 16);
+    plan.settings.bitrate = FirstPositive(param.nAudioBitrate, kDefaultAudioBitrate, 0);
+    plan.settings.maxBitrate = param.nAudioRateMode != 0 ? std::max(0, param.nAudioMaxBitrate) : 0;
+    plan.settings.flashRates = NeedsFlashRates(container, *plan.codec);
+    if (plan.settings.sampleRate <= 0 || plan.settings.channels <= 0)
+        throw WriterFailure(kWriterErrorArgument, "Sound of " + std::to_string(plan.settings.sampleRate) +
+                                                      " Hz with " + std::to_string(plan.settings.channels) +
+                                                      " channels cannot be written.");
+    return plan;
+}
+
+} // namespace
+
+FilePlan MakeFilePlan(const EncodeParam& param, const VideoFormat* video, const AudioFormat* audio,
+                      const WriterOptions& options) {
+    FilePlan plan{};
+    plan.container = FindContainer(param.fccFileFormat);
+    if (plan.container == nullptr)
+        throw WriterFailure(kWriterErrorFormat, "The file format " + FormatText(param) + " is not known.");
+    if (video != nullptr && param.bNoVideo == 0 && plan.container->video.front() != 0)
+        plan.video = MakeVideoPlan(param, *video, *plan.container, options);
+    if (audio != nullptr && param.bNoAudio == 0 && plan.container->audio.front() != 0)
+        plan.audio = MakeAudioPlan(param, *audio, *plan.container);
+    if (!plan.video && !plan.audio)
+        throw WriterFailure(kWriterErrorArgument,
+                            "There is nothing to write into a file of the format " + FormatText(param) + ".");
+    plan.bitExact = options.bBitExact != 0;
+    return plan;
+}
+
+} // namespace writer

@@ -1,0 +1,215 @@
+#include "writer/FormatTable.h"
+
+#include "media/FourCC.h"
+
+extern "C" {
+#include <libavformat/avformat.h>
+}
+
+#include <algorithm>
+#include <cctype>
+#include <cstring>
+#include <utility>
+#include <vector>
+
+namespace writer {
+namespace {
+
+constexpr uint32_t kXvid = FourCC("XVID");
+constexpr uint32_t kH264 = FourCC("H264");
+constexpr uint32_t kHevc = FourCC("HEVC");
+constexpr uint32_t kMjpg = FourCC("MJPG");
+constexpr uint32_t kVp8 = FourCC("VP80");
+constexpr uint32_t kVp9 = FourCC("VP90");
+constexpr uint32_t kMpeg2 = FourCC("MPG2");
+constexpr uint32_t kFlv1 = FourCC("FLV1");
+constexpr uint32_t kAac = FourCC("AAC ");
+constexpr uint32_t kMp3 = FourCC("MP3 ");
+constexpr uint32_t kAc3 = FourCC("AC3 ");
+constexpr uint32_t kFlac = FourCC("FLAC");
+constexpr uint32_t kOpus = FourCC("OPUS");
+constexpr uint32_t kVorbis = FourCC("VORB");
+constexpr uint32_t kPcm = FourCC("PCM ");
+
+// clang-format off
+constexpr std::array kVideoCodecs{
+    VideoCodec{kXvid,  AV_CODEC_ID_MPEG4,      "mpeg4",      false, false, false},
+    VideoCodec{kH264,  AV_CODEC_ID_H264,       "libx264",    true,  false, true},
+    VideoCodec{kHevc,  AV_CODEC_ID_HEVC,       "libx265",    true,  false, true},
+    VideoCodec{kMjpg,  AV_CODEC_ID_MJPEG,      "mjpeg",      false, true,  false},
+    VideoCodec{kVp8,   AV_CODEC_ID_VP8,        "libvpx",     false, false, true},
+    VideoCodec{kVp9,   AV_CODEC_ID_VP9,        "libvpx-vp9", false, false, true},
+    VideoCodec{kMpeg2, AV_CODEC_ID_MPEG2VIDEO, "mpeg2video", false, false, false},
+    VideoCodec{kFlv1,  AV_CODEC_ID_FLV1,       "flv",        false, false, false},
+};
+
+// The limits of AAC are the format's (6144 bits for a frame of 1024 samples), those of the others their encoders'.
+constexpr std::array kAudioCodecs{
+    AudioCodec{kAac,    AV_CODEC_ID_AAC,       "aac",        8, 0.0, 6.0},
+    AudioCodec{kMp3,    AV_CODEC_ID_MP3,       "libmp3lame", 2, 0.0, 8.0},
+    AudioCodec{kAc3,    AV_CODEC_ID_AC3,       "ac3",        6, 0.0, 14.0},
+    AudioCodec{kFlac,   AV_CODEC_ID_FLAC,      "flac",       8, 0.0, 0.0},
+    AudioCodec{kOpus,   AV_CODEC_ID_OPUS,      "libopus",    8, 0.2, 5.3},
+    AudioCodec{kVorbis, AV_CODEC_ID_VORBIS,    "libvorbis",  8, 1.0, 3.8},
+    AudioCodec{kPcm,    AV_CODEC_ID_PCM_S16LE, "pcm_s16le",  8, 0.0, 0.0},
+};
+
+using enum ContainerKind;
+constexpr std::array kContainers{
+    Container{FourCC("MP4 "), "MP4 (MPEG-4 Part 14)", "mp4,m4v", "mp4", kFragmented,
+              {kXvid, kH264, kHevc, kMjpg, kVp9, kMpeg2}, {kAac, kMp3, kAc3, kOpus, kVorbis}},
+    Container{FourCC("MOV "), "QuickTime", "mov,qt", "mov", kFragmented,
+              {kXvid, kH264, kHevc, kMjpg, kMpeg2}, {kAac, kMp3, kAc3, kPcm}},
+    Container{FourCC("MKV "), "Matroska", "mkv", "matroska", kStreamed,
+              {kXvid, kH264, kHevc, kMjpg, kVp8, kVp9, kMpeg2, kFlv1},
+              {kAac, kMp3, kAc3, kFlac, kOpus, kVorbis, kPcm}},
+    Container{FourCC("AVI "), "AVI (Audio Video Interleaved)", "avi,divx", "avi", kSteadyRate,
+              {kXvid, kH264, kMjpg, kVp8, kMpeg2, kFlv1}, {kMp3, kAac, kAc3, kPcm}},
+    Container{FourCC("WEBM"), "WebM", "webm", "webm", kStreamed, {kVp8, kVp9}, {kVorbis, kOpus}},
+    Container{FourCC("FLV "), "Flash Video", "flv", "flv", kStreamed, {kH264, kFlv1}, {kAac, kMp3}},
+    Container{FourCC("TS  "), "MPEG transport stream", "ts,m2ts,mts", "mpegts", kStreamed,
+              {kH264, kHevc, kXvid, kMpeg2}, {kAac, kMp3, kAc3, kOpus}},
+    Container{FourCC("M4A "), "MPEG-4 audio", "m4a,m4b", "ipod", kFragmented, {}, {kAac, kAc3}},
+    Container{FourCC("MP3 "), "MP3", "mp3", "mp3", kStreamed, {}, {kMp3}},
+    Container{FourCC("WAV "), "WAV (RIFF wave)", "wav", "wav", kSteadyRate, {}, {kPcm, kMp3, kAc3}},
+    Container{FourCC("FLAC"), "FLAC", "flac", "flac", kStreamed, {}, {kFlac}},
+    Container{FourCC("OGG "), "Ogg", "ogg,oga,opus", "ogg", kStreamed, {}, {kVorbis, kOpus, kFlac}},
+};
+
+/// Other names under which a codec is asked for, in capitals.
+constexpr std::array kAliases{
+    std::pair{FourCC("DIVX"), kXvid}, std::pair{FourCC("DX50"), kXvid},  std::pair{FourCC("FMP4"), kXvid},
+    std::pair{FourCC("MP4V"), kXvid}, std::pair{FourCC("AVC1"), kH264},  std::pair{FourCC("X264"), kH264},
+    std::pair{FourCC("H265"), kHevc}, std::pair{FourCC("HVC1"), kHevc},  std::pair{FourCC("HEV1"), kHevc},
+    std::pair{FourCC("X265"), kHevc}, std::pair{FourCC("JPEG"), kMjpg},  std::pair{FourCC("VP8 "), kVp8},
+    std::pair{FourCC("VP9 "), kVp9},  std::pair{FourCC("VP09"), kVp9},   std::pair{FourCC("MP2V"), kMpeg2},
+    std::pair{FourCC("MP4A"), kAac},  std::pair{FourCC(".MP3"), kMp3},   std::pair{FourCC("AC-3"), kAc3},
+    std::pair{FourCC("LPCM"), kPcm},  std::pair{FourCC("SOWT"), kPcm},
+};
+// clang-format on
+
+/// The code in capitals, other names replaced by the table's.
+uint32_t Canonical(uint32_t code) {
+    uint32_t upper = 0;
+    for (int shift = 0; shift < 32; shift += 8) {
+        const auto byte = static_cast<unsigned char>(code >> shift);
+        upper |= static_cast<uint32_t>(std::toupper(byte) & 0xFF) << shift;
+    }
+    for (const auto& [other, code_in_table] : kAliases) {
+        if (other == upper)
+            return code_in_table;
+    }
+    return upper;
+}
+
+template <typename Table>
+const typename Table::value_type* FindByCode(const Table& table, uint32_t code) {
+    const auto found =
+        std::find_if(table.begin(), table.end(), [code](const auto& row) { return row.code == code; });
+    return found == table.end() ? nullptr : &*found;
+}
+
+template <typename Table>
+const typename Table::value_type* FindFitting(const Table& table, const std::array<uint32_t, 10>& fitting,
+                                              uint32_t code) {
+    const uint32_t canonical = Canonical(code);
+    const bool fits = canonical != 0 && std::find(fitting.begin(), fitting.end(), canonical) != fitting.end();
+    return fits ? FindByCode(table, canonical) : nullptr;
+}
+
+template <typename Table>
+bool CanEncode(const Table& table, uint32_t code) {
+    const auto* codec = FindByCode(table, code);
+    return codec != nullptr && avcodec_find_encoder_by_name(codec->encoder) != nullptr;
+}
+
+/// The codes from `fitting` that can be encoded here, into the zeroed list `codes`; true when there is one.
+template <typename Table>
+bool CopyEncodable(const Table& table, const std::array<uint32_t, 10>& fitting, uint32_t* codes) {
+    const auto can_encode = [&](uint32_t code) { return code != 0 && CanEncode(table, code); };
+    return std::copy_if(fitting.begin(), fitting.end(), codes, can_encode) != codes;
+}
+
+FileFormatInfo Describe(const Container& container) {
+    FileFormatInfo info{};
+    info.fccFormat = container.code;
+    std::strncpy(info.szName, container.name, sizeof info.szName - 1);
+    std::strncpy(info.szExtensions, container.extensions, sizeof info.szExtensions - 1);
+    info.bHasVideo = CopyEncodable(kVideoCodecs, container.video, info.fccVideoCodecs) ? 1 : 0;
+    info.bHasAudio = CopyEncodable(kAudioCodecs, container.audio, info.fccAudioCodecs) ? 1 : 0;
+    return info;
+}
+
+} // namespace
+
+const Container* FindContainer(uint32_t code) {
+    return code == 0 ? nullptr : FindByCode(kContainers, Canonical(code));
+}
+
+const VideoCodec* FindVideoCodec(const Container& container, uint32_t code) {
+    return FindFitting(kVideoCodecs, container.video, code);
+}
+
+const AudioCodec* FindAudioCodec(const Container& container, uint32_t code) {
+    return FindFitting(kAudioCodecs, container.audio, code);
+}
+
+const AVCodec* FindEncoder(const VideoCodec& codec) {
+    return avcodec_find_encoder_by_name(codec.encoder);
+}
+
+const AVCodec* FindEncoder(const AudioCodec& codec, int bitsPerSample) {
+    if (codec.code != kPcm)
+        return avcodec_find_encoder_by_name(codec.encoder);
+    switch (bitsPerSample) {
+    case 8:
+        return avcodec_find_encoder(AV_CODEC_ID_PCM_U8);
+    case 24:
+        return avcodec_find_encoder(AV_CODEC_ID_PCM_S24LE);
+    case 32:
+        return avcodec_find_encoder(AV_CODEC_ID_PCM_S32LE);
+    default:
+        return avcodec_find_encoder(AV_CODEC_ID_PCM_S16LE);
+    }
+}
+
+bool NeedsFlashRates(const Container& container, const AudioCodec& codec) {
+    return container.code == FourCC("FLV ") && codec.code == kMp3;
+}
+
+uint32_t StreamTag(const Container& container, AVCodecID id) {
+    const bool mov = container.code == FourCC("MOV ");
+    if (id == AV_CODEC_ID_MPEG4 && (mov || container.code == FourCC("AVI ")))
+        return kXvid;
+    // Players of one large vendor take HEVC only under this tag.
+    if (id == AV_CODEC_ID_HEVC && container.kind == ContainerKind::kFragmented)
+        return FourCC("hvc1");
+    return 0;
+}
+
+std::string CodeText(uint32_t code) {
+    std::string text(4, ' ');
+    for (char& character : text) {
+        const auto byte = static_cast<char>(code & 0xFF);
+        character = byte >= ' ' && byte <= '~' ? byte : '?';
+        code >>= 8;
+    }
+    return text;
+}
+
+const FileFormatInfo* FileFormatInfos() {
+    static const std::vector<FileFormatInfo> table = [] {
+        std::vector<FileFormatInfo> entries;
+        for (const Container& container : kContainers) {
+            const FileFormatInfo info = Describe(container);
+            if (av_guess_format(container.muxer, nullptr, nullptr) != nullptr &&
+                (info.bHasVideo != 0 || info.bHasAudio != 0))
+                entries.push_back(info);
+        }
+        entries.push_back({});
+        return entries;
+    }();
+    return table.data();
+}
+
+} // namespace writer

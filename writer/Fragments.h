@@ -1,0 +1,25 @@
+// Files of the MP4 family while they grow: a row of fragments, each complete in itself.
+#ifndef MOVIECONV_WRITER_FRAGMENTS_H
+#define MOVIECONV_WRITER_FRAGMENTS_H
+
+#include "writer/AvioFile.h"
+#include "writer/Muxer.h"
+
+#include <functional>
+#include <memory>
+
+namespace writer {
+
+/// Writes the movie in the fragmented file `part`, written by `written`, into `out` once more with a single
+/// index. Times are those that went into `written`. `progress` is told the share done, 0 to 1. Throws
+/// WriterFailure, with kWriterErrorFinish when `part` cannot be read.
+void JoinFragments(const std::shared_ptr<ByteFile>& part, const Muxer& written, const Container& container,
+                   AvioFile& out, bool bitExact, const std::function<void(double)>& progress);
+
+/// Cuts a file off behind its last whole fragment, after a failure in the middle of one. Returns the new
+/// size, or a negated errno.
+int64_t CutToWholeFragments(ByteFile& part);
+
+} // namespace writer
+
+#endif

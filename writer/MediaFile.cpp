@@ -1,0 +1,369 @@
+#include "writer/MediaFile.h"
+
+#include "writer/Fragments.h"
+#include "writer/MediaTime.h"
+
+#include <algorithm>
+#include <cerrno>
+#include <cstring>
+#include <utility>
+
+namespace writer {
+namespace {
+
+constexpr int kPlanar420 = kPictureFormatPlanar420;
+
+/// Stretches of sound are handed on when they are this long, in parts of a second.
+constexpr int kStretchesPerSecond = 20;
+
+/// Shares of the finishing work that precede and follow the copy of the data.
+constexpr double kDrainedShare = 0.3;
+constexpr double kCopiedShare = 0.9;
+
+/// Finishing is told in steps of at least this share.
+constexpr double kTellStep = 0.02;
+
+bool Usable(const VideoImage& image) {
+    return image.nFormat == kPlanar420 && image.pY != nullptr && image.pU != nullptr && image.pV != nullptr &&
+           image.nWidth > 0 && image.nHeight > 0 && image.nWidth <= 32768 && image.nHeight <= 32768 &&
+           std::abs(image.nPitchY) >= image.nWidth && std::abs(image.nPitchU) >= (image.nWidth + 1) / 2 &&
+           std::abs(image.nPitchV) >= (image.nWidth + 1) / 2;
+}
+
+PcmFormat FormatOf(const AudioFrame& frame) {
+    return {frame.nSampleRate, frame.nChannels, frame.nBitsPerSample};
+}
+
+WriterFailure SystemFailure(int kind, const std::string& what, int error) {
+    if (error == ENOSPC || error == EDQUOT)
+        kind = kWriterErrorNoSpace;
+    return {kind, what + ": " + std::strerror(error) + ".", error};
+}
+
+bool IsFragmented(const FilePlan& plan) {
+    return plan.container->kind == ContainerKind::kFragmented;
+}
+
+EncoderFlags FlagsFor(const FilePlan& plan) {
+    const AVOutputFormat* format = av_guess_format(plan.container->muxer, nullptr, nullptr);
+    return {format != nullptr && (format->flags & AVFMT_GLOBALHEADER) != 0, plan.bitExact};
+}
+
+int AddEncoder(Muxer& muxer, const AVCodecContext& context, AVRational unit, AVRational rate, int64_t runUp) {
+    AVCodecParameters* parameters = avcodec_parameters_alloc();
+    const int error =
+        parameters == nullptr ? AVERROR(ENOMEM) : avcodec_parameters_from_context(parameters, &context);
+    const int stream =
+        error < 0 ? error : muxer.AddStream({parameters, unit, rate, context.sample_aspect_ratio, runUp});
+    avcodec_parameters_free(&parameters);
+    if (error < 0)
+        throw std::bad_alloc();
+    return stream;
+}
+
+} // namespace
+
+MediaFile::MediaFile(const std::string& target, const EncodeParam& param, const VideoFormat* video,
+                     const AudioFormat* audio, std::shared_ptr<FileRecord> record, FileSystem& files)
+    : plan_(MakeFilePlan(param, video, audio, record->Options())),
+      target_(ResolveTarget(target)),
+      record_(std::move(record)),
+      files_(files),
+      stamps_(plan_.video ? plan_.video->pictureLength : kUnitsPerSecond, plan_.video.has_value()) {
+    const int obstacle = CheckTarget(target_);
+    if (obstacle == EEXIST && record_->Options().bKeepExisting != 0)
+        throw WriterFailure(kWriterErrorExists, "The file exists already.", EEXIST);
+    if (obstacle != 0 && obstacle != EEXIST)
+        throw SystemFailure(kWriterErrorOpen, "The name belongs to something that is not a file", obstacle);
+    OpenPart();
+    try {
+        OpenStages();
+    } catch (...) {
+        const WriterFailure failure = Explain(std::current_exception());
+        files_.Remove(partPath_);
+        throw failure;
+    }
+    record_->SetTemporaryPath(partPath_);
+    StartPictures();
+}
+
+MediaFile::~MediaFile() = default;
+
+void MediaFile::OpenPart() {
+    int error = 0;
+    std::shared_ptr<ByteFile> file = CreateBeside(files_, target_, ".part", partPath_, error);
+    if (!file)
+        throw SystemFailure(kWriterErrorOpen,
+                            "No file can be created in the folder \"" + FolderOf(target_) + "\"", error);
+    part_ = std::make_unique<AvioFile>(std::move(file), AvioFile::Mode::kWrite,
+                                       [this] { return record_->AskAboutFullDisk(); });
+}
+
+void MediaFile::OpenStages() {
+    const EncoderFlags flags = FlagsFor(plan_);
+    muxer_ = std::make_unique<Muxer>(*plan_.container, *part_, IsFragmented(plan_), plan_.bitExact);
+    if (plan_.video) {
+        pictures_ = std::make_unique<PictureStage>(*plan_.video, flags);
+        const AVCodecContext& encoder = pictures_->Encoder();
+        const PictureClock& clock = plan_.video->clock;
+        pictureStream_ = AddEncoder(*muxer_, encoder, clock.tick, clock.rate,
+                                    int64_t{encoder.has_b_frames} * clock.ticksPerPicture);
+    }
+    if (plan_.audio) {
+        const bool fills_start = plan_.container->kind == ContainerKind::kSteadyRate;
+        sound_ = std::make_unique<SoundStage>(*plan_.audio, flags, fills_start);
+        const AVCodecContext& encoder = sound_->Encoder();
+        soundStream_ =
+            AddEncoder(*muxer_, encoder, {1, encoder.sample_rate}, {0, 1}, encoder.initial_padding);
+    }
+    muxer_->WriteHeader();
+    if (part_->Flush() != 0)
+        throw WriterFailure(kWriterErrorWrite, "");
+    record_->Update([&](WriterStatus& status) {
+        status.llBytesWritten = part_->Size();
+        if (pictures_) {
+            status.nWidth = pictures_->Encoder().width;
+            status.nHeight = pictures_->Encoder().height;
+        }
+        if (sound_) {
+            status.nSampleRate = sound_->Encoder().sample_rate;
+            status.nAudioBitrate = static_cast<int32_t>(sound_->Encoder().bit_rate);
+        }
+    });
+}
+
+void MediaFile::StartPictures() {
+    if (!pictures_)
+        return;
+    const auto shown = [this](int64_t count) {
+        record_->Update([count](WriterStatus& status) {
+            status.llPicturesWritten += count;
+            status.llPicturesDropped += count == 0 ? 1 : 0;
+            status.llPicturesRepeated += std::max<int64_t>(0, count - 1);
+        });
+    };
+    pictures_->Start([this](AVPacket& packet) { Write(packet, pictureStream_); }, shown,
+                     [this](const std::exception_ptr& error) { Fail(error); });
+}
+
+bool MediaFile::WriteVideo(const VideoImage& image) {
+    if (!pictures_ || !Usable(image) || record_->Failed())
+        return false;
+    const int64_t time = stamps_.AddPicture(image.llTime);
+    record_->Update([&](WriterStatus& status) {
+        ++status.llPicturesReceived;
+        status.llStampsRepaired = stamps_.Repairs();
+        status.dVideoReceived = static_cast<double>(time + plan_.video->pictureLength) / kUnitsPerSecond;
+    });
+    try {
+        StartSoundIfKnown();
+        return pictures_->Push(image, time);
+    } catch (...) {
+        Fail(std::current_exception());
+        return false;
+    }
+}
+
+bool MediaFile::WriteAudio(const AudioFrame& frame) {
+    const PcmFormat format = FormatOf(frame);
+    if (!sound_ || !format.Valid() || frame.pData == nullptr || frame.nLength <= 0 || record_->Failed())
+        return false;
+    stamps_.AddSound(frame.llTime, frame.nLength, format.BytesPerSecond(), frame.nType == kMediaTypeSilence);
+    record_->Update([&](WriterStatus& status) {
+        status.llSamplesReceived += frame.nLength / format.BytesPerFrame();
+        status.dAudioReceived = static_cast<double>(stamps_.SoundLength()) / kUnitsPerSecond;
+    });
+    if (waiting_.empty() || !(waiting_.back().format == format))
+        waiting_.push_back({format, {}});
+    std::vector<uint8_t>& data = waiting_.back().data;
+    data.insert(data.end(), frame.pData, frame.pData + frame.nLength);
+    StartSoundIfKnown();
+    const bool long_enough = waiting_.size() > 1 || static_cast<int64_t>(data.size()) >=
+                                                        format.BytesPerSecond() / kStretchesPerSecond;
+    return !soundStarted_ || !long_enough || PushSound();
+}
+
+void MediaFile::StartSoundIfKnown() {
+    if (!sound_ || soundStarted_ || !stamps_.SoundStart())
+        return;
+    soundStarted_ = true;
+    const auto encoded = [this](int samples) {
+        record_->Update([samples](WriterStatus& status) { status.llSamplesWritten += samples; });
+    };
+    sound_->Start(
+        *stamps_.SoundStart(), [this](AVPacket& packet) { Write(packet, soundStream_); }, encoded,
+        [this](const std::exception_ptr& error) { Fail(error); });
+}
+
+bool MediaFile::PushSound() {
+    const std::vector<SoundBlock> blocks = std::exchange(waiting_, {});
+    return std::all_of(blocks.begin(), blocks.end(),
+                       [this](const SoundBlock& block) { return sound_->Push(block); });
+}
+
+void MediaFile::Write(AVPacket& packet, int stream) {
+    muxer_->Write(packet, stream);
+    record_->Update([this](WriterStatus& status) { status.llBytesWritten = part_->Size(); });
+}
+
+/// The failure in the terms of the status header. A failed file explains more than what the multiplexer made
+/// of it.
+WriterFailure MediaFile::Explain(const std::exception_ptr& error) const {
+    if (const int code = part_ ? part_->Error() : 0; code != 0)
+        return SystemFailure(kWriterErrorWrite,
+                             "Writing to \"" + partPath_ + "\" failed after " +
+                                 std::to_string(part_->Size()) + " bytes",
+                             code);
+    try {
+        std::rethrow_exception(error);
+    } catch (const WriterFailure& failure) {
+        return failure;
+    } catch (const std::exception& failure) {
+        return {kWriterErrorInternal, failure.what()};
+    }
+}
+
+void MediaFile::Fail(const std::exception_ptr& error) {
+    if (record_->Fail(Explain(error)))
+        record_->Tell(kWriterEventFailed);
+    CancelStages();
+}
+
+void MediaFile::CancelStages() {
+    if (pictures_)
+        pictures_->Cancel();
+    if (sound_)
+        sound_->Cancel();
+}
+
+bool MediaFile::Close() {
+    record_->Update([](WriterStatus& status) { status.nState = kWriterFileFinishing; });
+    record_->Tell(kWriterEventFinishing);
+    DrainStages();
+    if (!record_->Failed()) {
+        try {
+            FinishPart();
+        } catch (...) {
+            Fail(std::current_exception());
+        }
+    }
+    const bool complete = !record_->Failed();
+    if (!complete)
+        CloseFailed();
+    record_->Update([complete](WriterStatus& status) {
+        status.nState = complete ? kWriterFileComplete : kWriterFileFailed;
+        status.dFinished = complete ? 1.0 : status.dFinished;
+    });
+    record_->Tell(kWriterEventClosed);
+    return complete;
+}
+
+void MediaFile::DrainStages() {
+    stamps_.Finish();
+    if (!waiting_.empty() && !record_->Failed()) {
+        StartSoundIfKnown();
+        PushSound();
+    }
+    if (pictures_)
+        pictures_->Finish();
+    if (sound_)
+        sound_->Finish();
+    if (pictures_)
+        pictures_->Join();
+    if (sound_)
+        sound_->Join();
+}
+
+void MediaFile::FinishPart() {
+    Progress(kDrainedShare);
+    muxer_->WriteTrailer();
+    if (part_->Flush() != 0)
+        throw WriterFailure(kWriterErrorWrite, "");
+    record_->Update([this](WriterStatus& status) {
+        status.llBytesWritten = part_->Size();
+        status.dVideoWritten = pictureStream_ < 0 ? 0.0 : muxer_->Stream(pictureStream_).seconds;
+        // Some codecs count the padding of the last frame.
+        const double encoded =
+            sound_ ? static_cast<double>(status.llSamplesWritten) / status.nSampleRate : 0.0;
+        status.dAudioWritten =
+            soundStream_ < 0 ? 0.0 : std::min(encoded, muxer_->Stream(soundStream_).seconds);
+    });
+    if (!IsFragmented(plan_)) {
+        Publish(partPath_, *part_->File());
+        return;
+    }
+    JoinPart();
+}
+
+/// Gives the data its final form in a second file. The fragmented one is a whole movie too: it takes the name
+/// when there is no room for both.
+void MediaFile::JoinPart() {
+    int error = 0;
+    std::string path;
+    const std::shared_ptr<ByteFile> file = CreateBeside(files_, target_, ".joined.part", path, error);
+    if (file) {
+        try {
+            JoinInto(path, file);
+            files_.Remove(partPath_);
+            return;
+        } catch (const WriterFailure& failure) {
+            files_.Remove(path);
+            if (failure.Kind() == kWriterErrorFinish)
+                throw;
+            WriteLog("Keeping the fragmented form of \"" + target_ + "\": " + failure.what());
+        }
+    }
+    Publish(partPath_, *part_->File());
+}
+
+void MediaFile::JoinInto(const std::string& path, const std::shared_ptr<ByteFile>& file) {
+    AvioFile out(file, AvioFile::Mode::kWrite);
+    JoinFragments(part_->File(), *muxer_, *plan_.container, out, plan_.bitExact,
+                  [this](double share) { Progress(kDrainedShare + (kCopiedShare - kDrainedShare) * share); });
+    if (const int error = out.Flush(); error != 0)
+        throw SystemFailure(kWriterErrorWrite, "Writing to \"" + path + "\" failed", error);
+    Publish(path, *file);
+    record_->Update([&out](WriterStatus& status) { status.llBytesWritten = out.Size(); });
+}
+
+/// Syncs the file and gives it the target's name.
+void MediaFile::Publish(const std::string& path, ByteFile& file) {
+    Progress(kCopiedShare);
+    if (const int64_t result = file.Sync(); result < 0)
+        throw SystemFailure(kWriterErrorFinish, "Syncing \"" + path + "\" failed", static_cast<int>(-result));
+    const bool replace = record_->Options().bKeepExisting == 0;
+    if (const int error = files_.Rename(path, target_, replace); error != 0)
+        throw SystemFailure(kWriterErrorFinish, "Renaming \"" + path + "\" failed", error);
+    record_->SetTemporaryPath("");
+    if (const int error = files_.SyncFolder(target_); error != 0)
+        WriteLog("Syncing the folder of \"" + target_ + "\" failed: " + std::strerror(error) + ".");
+}
+
+/// Leaves the temporary file in a form that players take, or removes it.
+void MediaFile::CloseFailed() {
+    if (record_->Options().bRemovePartial != 0) {
+        files_.Remove(partPath_);
+        record_->SetTemporaryPath("");
+        return;
+    }
+    if (part_->Error() == 0) {
+        try {
+            muxer_->WriteTrailer();
+            part_->Flush();
+        } catch (const WriterFailure& failure) {
+            WriteLog("The end of \"" + partPath_ + "\" is missing: " + failure.what());
+        }
+    }
+    const int64_t size = IsFragmented(plan_) ? CutToWholeFragments(*part_->File()) : part_->Size();
+    record_->Update([size](WriterStatus& status) { status.llBytesWritten = std::max<int64_t>(0, size); });
+}
+
+void MediaFile::Progress(double share) {
+    record_->Update([share](WriterStatus& status) { status.dFinished = share; });
+    if (share < toldShare_ + kTellStep)
+        return;
+    toldShare_ = share;
+    record_->Tell(kWriterEventFinishing);
+}
+
+} // namespace writer

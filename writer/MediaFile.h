@@ -1,0 +1,90 @@
+// One output file from its creation to its real name.
+//
+//     engine's worker                    encoding threads                 file
+//     WriteVideo ─ copy ─ 8 pictures ─> PictureStage ─┐
+//                                                     ├─> Muxer (one lock) ─> NAME.part ─ Close ─> NAME
+//     WriteAudio ─ copy ─ 1 s of sound ─> SoundStage ─┘
+//
+// The data goes to a temporary file beside the target that can be played up to wherever it ends. Closing
+// encodes what is left, gives files of the MP4 family one index (a copy without encoding), syncs, and
+// renames. Whatever fails before that leaves the target as it was and the temporary file playable. The first
+// failure stays: the stages are cancelled, so that nobody waits for them, and nothing more is taken.
+#ifndef MOVIECONV_WRITER_MEDIAFILE_H
+#define MOVIECONV_WRITER_MEDIAFILE_H
+
+#include "media/EncodeParam.h"
+#include "media/MediaRecords.h"
+#include "writer/AvioFile.h"
+#include "writer/FilePlan.h"
+#include "writer/Muxer.h"
+#include "writer/OutputFile.h"
+#include "writer/PictureStage.h"
+#include "writer/SoundStage.h"
+#include "writer/StampNormaliser.h"
+#include "writer/StatusBoard.h"
+
+#include <cstdint>
+#include <exception>
+#include <memory>
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace writer {
+
+/// All functions are called on one thread, the engine's worker.
+class MediaFile {
+public:
+    /// Creates the temporary file beside `target`. Throws WriterFailure, and leaves nothing behind then.
+    MediaFile(const std::string& target, const EncodeParam& param, const VideoFormat* video,
+              const AudioFormat* audio, std::shared_ptr<FileRecord> record, FileSystem& files);
+    MediaFile(const MediaFile&) = delete;
+    MediaFile& operator=(const MediaFile&) = delete;
+    ~MediaFile();
+
+    /// False when the record makes no sense, the file has no such stream, or it has failed.
+    bool WriteVideo(const VideoImage& image);
+    bool WriteAudio(const AudioFrame& frame);
+
+    /// Finishes the file; true when it is complete under its real name. Nothing may be called afterwards.
+    bool Close();
+
+private:
+    void OpenPart();
+    void OpenStages();
+    void StartPictures();
+    void StartSoundIfKnown();
+    bool PushSound();
+    void Write(AVPacket& packet, int stream);
+    void Fail(const std::exception_ptr& error);
+    WriterFailure Explain(const std::exception_ptr& error) const;
+    void CancelStages();
+    void DrainStages();
+    void FinishPart();
+    void JoinPart();
+    void JoinInto(const std::string& path, const std::shared_ptr<ByteFile>& file);
+    void Publish(const std::string& path, ByteFile& file);
+    void CloseFailed();
+    void Progress(double share);
+
+    const FilePlan plan_;
+    const std::string target_;
+    const std::shared_ptr<FileRecord> record_;
+    FileSystem& files_;
+    std::string partPath_;
+    std::unique_ptr<AvioFile> part_;
+    std::unique_ptr<Muxer> muxer_;
+    int pictureStream_ = -1;
+    int soundStream_ = -1;
+    StampNormaliser stamps_;
+    std::vector<SoundBlock>
+        waiting_; ///< Sound whose place is not known yet, or too short a stretch to hand on.
+    bool soundStarted_ = false;
+    double toldShare_ = 0;
+    std::unique_ptr<PictureStage> pictures_;
+    std::unique_ptr<SoundStage> sound_;
+};
+
+} // namespace writer
+
+#endif

@@ -1,0 +1,146 @@
+#include "writer/Muxer.h"
+
+#include "writer/WriterFailure.h"
+#include "writer/WriterStatus.h"
+
+#include <algorithm>
+#include <new>
+#include <string>
+
+namespace writer {
+namespace {
+
+/// Length of fragments in microseconds: what is lost at most when a file is cut off, unless key frames are
+/// rarer.
+constexpr int64_t kFragmentLength = 1'000'000;
+
+bool Has(const AVFormatContext& output, AVCodecID id) {
+    return std::any_of(output.streams, output.streams + output.nb_streams,
+                       [id](const AVStream* stream) { return stream->codecpar->codec_id == id; });
+}
+
+bool HasPictures(const AVFormatContext& output) {
+    return std::any_of(output.streams, output.streams + output.nb_streams, [](const AVStream* stream) {
+        return stream->codecpar->codec_type == AVMEDIA_TYPE_VIDEO;
+    });
+}
+
+void SetFragments(const AVFormatContext& output, av::Options& options) {
+    // Times are written as they are, from the first fragment on.
+    std::string flags = "empty_moov+default_base_moof+frag_discont";
+    options.Set("use_editlist", "0");
+    options.Set("avoid_negative_ts", "disabled");
+    if (HasPictures(output)) {
+        flags += "+frag_keyframe";
+        options.Set("min_frag_duration", kFragmentLength);
+    } else {
+        options.Set("frag_duration", kFragmentLength);
+    }
+    // The description of this codec is only known from its first packet.
+    if (Has(output, AV_CODEC_ID_AC3))
+        flags += "+delay_moov";
+    options.Set("movflags", flags.c_str());
+}
+
+} // namespace
+
+Muxer::Muxer(const Container& container, AvioFile& file, bool fragmented, bool bitExact)
+    : container_(container), fragmented_(fragmented), packet_(av_packet_alloc()) {
+    AVFormatContext* output = nullptr;
+    const int error = avformat_alloc_output_context2(&output, nullptr, container.muxer, nullptr);
+    output_.reset(output);
+    if (!packet_)
+        throw std::bad_alloc();
+    Check(error, "cannot be made");
+    output_->pb = file.Io();
+    output_->flags |= AVFMT_FLAG_CUSTOM_IO;
+    if (bitExact)
+        output_->flags |= AVFMT_FLAG_BITEXACT;
+}
+
+int Muxer::AddStream(const MuxedStream& stream) {
+    AVStream* made = avformat_new_stream(output_.get(), nullptr);
+    if (made == nullptr)
+        throw std::bad_alloc();
+    Check(avcodec_parameters_copy(made->codecpar, stream.parameters), "does not take a stream");
+    made->codecpar->codec_tag = StreamTag(container_, made->codecpar->codec_id);
+    made->time_base = stream.unit;
+    made->avg_frame_rate = stream.rate;
+    made->sample_aspect_ratio = stream.sampleAspect;
+    streams_.push_back({stream.unit, stream.runUp});
+    return made->index;
+}
+
+void Muxer::WriteHeader() {
+    av::Options options;
+    if (fragmented_)
+        SetFragments(*output_, options);
+    else if (container_.kind == ContainerKind::kSteadyRate)
+        options.Set("avoid_negative_ts", "disabled"); // Moving pictures by less than one would lose one.
+    Check(avformat_write_header(output_.get(), options.Get()), "refuses its header");
+    if (fragmented_)
+        SetDelays();
+}
+
+void Muxer::Write(AVPacket& packet, int stream) {
+    const std::lock_guard lock(mutex_);
+    State& state = streams_[static_cast<size_t>(stream)];
+    const AVStream* out = output_->streams[stream];
+    NoteTimes(state, packet);
+    av_packet_move_ref(packet_.get(), &packet);
+    av_packet_rescale_ts(packet_.get(), state.unit, out->time_base);
+    packet_->pts += state.delay;
+    packet_->dts += state.delay;
+    // A coarse unit can make two times equal.
+    if (state.lastDts != AV_NOPTS_VALUE && packet_->dts <= state.lastDts) {
+        packet_->dts = state.lastDts + 1;
+        packet_->pts = std::max(packet_->pts, packet_->dts);
+    }
+    state.lastDts = packet_->dts;
+    packet_->stream_index = stream;
+    Check(av_interleaved_write_frame(output_.get(), packet_.get()), "refuses a packet");
+}
+
+void Muxer::WriteTrailer() {
+    const std::lock_guard lock(mutex_);
+    Check(av_write_trailer(output_.get()), "cannot be finished");
+}
+
+Muxer::Written Muxer::Stream(int stream) const {
+    const std::lock_guard lock(mutex_);
+    const State& state = streams_[static_cast<size_t>(stream)];
+    const AVStream* out = output_->streams[stream];
+    const int64_t length = state.endPts - state.firstPts - out->codecpar->initial_padding;
+    const int64_t run_up = av_rescale_q(state.runUp, state.unit, out->time_base);
+    return {{out->codecpar, out->time_base, out->avg_frame_rate, out->sample_aspect_ratio, run_up},
+            state.delay,
+            static_cast<double>(std::max<int64_t>(0, length)) * av_q2d(state.unit)};
+}
+
+void Muxer::NoteTimes(State& state, const AVPacket& packet) {
+    if (state.lastDts == AV_NOPTS_VALUE)
+        state.firstPts = state.endPts = packet.pts;
+    state.firstPts = std::min(state.firstPts, packet.pts);
+    state.endPts = std::max(state.endPts, packet.pts + packet.duration);
+}
+
+void Muxer::Check(int result, const char* what) const {
+    if (result < 0)
+        throw WriterFailure(kWriterErrorEncode,
+                            std::string("The container ") + what + ": " + av::ErrorText(result) + ".");
+}
+
+void Muxer::SetDelays() {
+    AVRational longest{0, 1};
+    for (const State& state : streams_) {
+        const AVRational seconds = av_mul_q(av_make_q(static_cast<int>(state.runUp), 1), state.unit);
+        if (av_cmp_q(seconds, longest) > 0)
+            longest = seconds;
+    }
+    for (size_t stream = 0; stream < streams_.size(); ++stream) {
+        const AVRational unit = output_->streams[stream]->time_base;
+        streams_[stream].delay = av_rescale_q_rnd(1, longest, unit, AV_ROUND_UP);
+    }
+}
+
+} // namespace writer

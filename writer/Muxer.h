@@ -1,0 +1,76 @@
+// Interleaves encoded packets and writes them in a container.
+#ifndef MOVIECONV_WRITER_MUXER_H
+#define MOVIECONV_WRITER_MUXER_H
+
+#include "ffmpeg/AvHandles.h"
+#include "writer/AvioFile.h"
+#include "writer/FormatTable.h"
+
+#include <cstdint>
+#include <mutex>
+#include <vector>
+
+namespace writer {
+
+/// One stream as it enters a muxer.
+struct MuxedStream {
+    const AVCodecParameters* parameters; ///< Read during AddStream only.
+    AVRational unit;                     ///< Unit of the packets' times, in seconds.
+    AVRational rate;                     ///< Pictures per second; 0/1 for sound.
+    AVRational sampleAspect;             ///< Shape of the pixels; 0/1 for sound.
+    int64_t runUp;                       ///< How far below 0 times can begin, in the unit.
+};
+
+/// Streams are added, the header is written, then packets come from any thread, then the end.
+class Muxer {
+public:
+    /// `fragmented`: the file can be played up to wherever it ends, at the price of an index spread all over
+    /// it. All functions throw WriterFailure (kWriterErrorEncode); where `file` has failed, its error is the
+    /// real reason.
+    Muxer(const Container& container, AvioFile& file, bool fragmented, bool bitExact);
+
+    /// Returns the stream's number, from 0 on. A fragmented file cannot express times below 0: all its times
+    /// are later by the longest run-up.
+    int AddStream(const MuxedStream& stream);
+    void WriteHeader();
+
+    /// Takes the packet's content. Times are in the stream's unit; those of decoding must not fall.
+    void Write(AVPacket& packet, int stream);
+
+    void WriteTrailer();
+
+    /// What a reader of the file, and a second muxer for the same packets, need to know of a stream.
+    struct Written {
+        MuxedStream description; ///< In the file's unit.
+        int64_t delay;  ///< By how much times in the file are later than those that came, in that unit.
+        double seconds; ///< From the start of the first packet to the end of the last, without run-up.
+    };
+    Written Stream(int stream) const;
+
+    int StreamCount() const { return static_cast<int>(streams_.size()); }
+
+private:
+    struct State {
+        AVRational unit{0, 1};
+        int64_t runUp = 0;
+        int64_t delay = 0; ///< In the file's unit.
+        int64_t lastDts = AV_NOPTS_VALUE;
+        int64_t firstPts = 0; ///< In the stream's own unit, as endPts.
+        int64_t endPts = 0;
+    };
+
+    static void NoteTimes(State& state, const AVPacket& packet);
+    void Check(int result, const char* what) const;
+    void SetDelays();
+
+    const Container& container_;
+    const bool fragmented_;
+    av::Output output_;
+    av::Packet packet_;
+    mutable std::mutex mutex_; ///< Guards everything once the header is written.
+    std::vector<State> streams_;
+};
+
+} // namespace writer
+
+#endif

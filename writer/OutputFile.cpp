@@ -1,0 +1,139 @@
+#include "writer/OutputFile.h"
+
+#include <algorithm>
+#include <cerrno>
+#include <climits>
+#include <cstdio>
+#include <cstdlib>
+#include <memory>
+
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+namespace writer {
+namespace {
+
+/// Calls again what a signal has interrupted; the result, or the negated errno.
+template <typename Call>
+int64_t Retry(Call call) {
+    int64_t result;
+    do {
+        result = call();
+    } while (result < 0 && errno == EINTR);
+    return result < 0 ? -errno : result;
+}
+
+class PosixFile final : public ByteFile {
+public:
+    explicit PosixFile(int descriptor) : descriptor_(descriptor) {}
+    ~PosixFile() override { close(descriptor_); }
+
+    int64_t Write(const uint8_t* data, int64_t size) override {
+        return Retry([&] { return write(descriptor_, data, static_cast<size_t>(size)); });
+    }
+    int64_t Read(uint8_t* data, int64_t size) override {
+        return Retry([&] { return read(descriptor_, data, static_cast<size_t>(size)); });
+    }
+    int64_t Seek(int64_t offset, int whence) override {
+        return Retry([&] { return lseek(descriptor_, offset, whence); });
+    }
+    int64_t Truncate(int64_t size) override {
+        return Retry([&] { return ftruncate(descriptor_, size); });
+    }
+    int64_t Sync() override {
+        return Retry([&] { return fsync(descriptor_); });
+    }
+
+private:
+    const int descriptor_;
+};
+
+class PosixFiles final : public FileSystem {
+public:
+    std::unique_ptr<ByteFile> Create(const std::string& path, int& error) override {
+        const int64_t descriptor =
+            Retry([&] { return open(path.c_str(), O_RDWR | O_CREAT | O_EXCL | O_CLOEXEC, 0666); });
+        error = descriptor < 0 ? static_cast<int>(-descriptor) : 0;
+        return descriptor < 0 ? nullptr : std::make_unique<PosixFile>(static_cast<int>(descriptor));
+    }
+
+    int Rename(const std::string& from, const std::string& to, bool replace) override {
+        if (replace)
+            return rename(from.c_str(), to.c_str()) == 0 ? 0 : errno;
+        if (renameat2(AT_FDCWD, from.c_str(), AT_FDCWD, to.c_str(), RENAME_NOREPLACE) == 0)
+            return 0;
+        if (errno != EINVAL && errno != ENOSYS)
+            return errno;
+        // File systems without that operation have hard links or nothing.
+        if (link(from.c_str(), to.c_str()) != 0)
+            return errno;
+        return Remove(from);
+    }
+
+    int Remove(const std::string& path) override { return unlink(path.c_str()) == 0 ? 0 : errno; }
+
+    int SyncFolder(const std::string& path) override {
+        const int descriptor = open(FolderOf(path).c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
+        if (descriptor < 0)
+            return errno;
+        const int error = fsync(descriptor) == 0 ? 0 : errno;
+        close(descriptor);
+        // Some file systems cannot sync a folder; there is nothing more that one could do.
+        return error == EINVAL ? 0 : error;
+    }
+};
+
+/// `name` cut to at most `size` bytes without leaving half a UTF-8 character.
+std::string CutName(const std::string& name, size_t size) {
+    if (name.size() <= size)
+        return name;
+    size_t end = size;
+    while (end > 0 && (static_cast<unsigned char>(name[end]) & 0xC0) == 0x80)
+        --end;
+    return name.substr(0, end);
+}
+
+} // namespace
+
+FileSystem& SystemFiles() {
+    static PosixFiles files;
+    return files;
+}
+
+int CheckTarget(const std::string& path) {
+    struct stat status {};
+    if (stat(path.c_str(), &status) != 0)
+        return 0;
+    if (S_ISREG(status.st_mode))
+        return EEXIST;
+    return S_ISDIR(status.st_mode) ? EISDIR : EINVAL;
+}
+
+std::string ResolveTarget(const std::string& path) {
+    const std::unique_ptr<char, decltype(&std::free)> real(realpath(path.c_str(), nullptr), &std::free);
+    return real ? std::string(real.get()) : path;
+}
+
+std::string FolderOf(const std::string& path) {
+    const size_t slash = path.rfind('/');
+    if (slash == std::string::npos)
+        return ".";
+    return slash == 0 ? "/" : path.substr(0, slash);
+}
+
+std::unique_ptr<ByteFile> CreateBeside(FileSystem& files, const std::string& target,
+                                       const std::string& suffix, std::string& path, int& error) {
+    constexpr int kMostNumbers = 1000;
+    const size_t name_at = target.rfind('/') == std::string::npos ? 0 : target.rfind('/') + 1;
+    for (int number = 1; number <= kMostNumbers; ++number) {
+        const std::string tail = number == 1 ? suffix : suffix + std::to_string(number);
+        path = target.substr(0, name_at) + CutName(target.substr(name_at), NAME_MAX - tail.size()) + tail;
+        std::unique_ptr<ByteFile> file = files.Create(path, error);
+        if (file || error != EEXIST)
+            return file;
+    }
+    return nullptr;
+}
+
+} // namespace writer

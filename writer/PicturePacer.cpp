@@ -1,0 +1,98 @@
+#include "writer/PicturePacer.h"
+
+#include "writer/MediaTime.h"
+
+extern "C" {
+#include <libavutil/mathematics.h>
+}
+
+#include <algorithm>
+#include <cmath>
+#include <cstdlib>
+
+namespace writer {
+namespace {
+
+constexpr AVRational kUnit{1, static_cast<int>(kUnitsPerSecond)};
+
+/// Sources whose stamps are rounded to milliseconds still mean a steady rate.
+constexpr int64_t kGridTolerance = 2 * kUnitsPerSecond / 1000;
+
+} // namespace
+
+AVRational ExactRate(double rate) {
+    constexpr double kNear = 0.005;
+    const double whole = std::round(rate);
+    if (whole >= 1 && whole <= 60000 && std::abs(rate - whole) < 0.0005)
+        return {static_cast<int>(whole), 1};
+    const double ntsc = std::round(rate * 1.001);
+    if (ntsc >= 1 && ntsc <= 1000 && std::abs(rate * 1.001 - ntsc) < kNear) {
+        AVRational exact{static_cast<int>(ntsc) * 1000, 1001};
+        av_reduce(&exact.num, &exact.den, exact.num, exact.den, 1'000'000);
+        return exact;
+    }
+    const AVRational near = av_d2q(rate, 60000);
+    return near.num > 0 ? near : AVRational{1, 60000};
+}
+
+PictureClock MakePictureClock(AVRational rate, bool wholePictures) {
+    if (wholePictures)
+        return {rate, av_inv_q(rate), 1};
+    // As fine as the usual clocks of files: a hundred microseconds or better.
+    constexpr int kFinest = 10000;
+    int factor = 1;
+    while (rate.num * factor < kFinest)
+        factor *= 2;
+    return {rate, {1, rate.num * factor}, rate.den * factor};
+}
+
+PicturePacer::PicturePacer(const PictureClock& clock, bool keepStamps)
+    : clock_(clock), keepStamps_(keepStamps) {}
+
+PicturePacer::Showing PicturePacer::Add(int64_t time) {
+    if (!origin_)
+        origin_ = time;
+    if (keepStamps_) {
+        const Showing showing = ShowOnce();
+        pending_ = lastTick_ = TickOf(time);
+        return showing;
+    }
+    const int64_t index = GridIndex(time);
+    const Showing showing = ShowUntil(index);
+    pending_ = std::max(index, lastTick_.value_or(index - 1) + 1);
+    return showing;
+}
+
+PicturePacer::Showing PicturePacer::Finish(int64_t end) {
+    if (keepStamps_)
+        return ShowOnce();
+    return ShowUntil(std::max(GridIndex(end), pending_.value_or(0) + 1));
+}
+
+PicturePacer::Showing PicturePacer::ShowOnce() {
+    return pending_ ? Showing{*pending_, 1} : Showing{};
+}
+
+/// Shows the pending picture from its place on the grid up to the place before `index`.
+PicturePacer::Showing PicturePacer::ShowUntil(int64_t index) {
+    if (!pending_ || index <= *pending_)
+        return {};
+    lastTick_ = index - 1;
+    return {*pending_ * clock_.ticksPerPicture, index - *pending_};
+}
+
+int64_t PicturePacer::GridIndex(int64_t time) const {
+    return av_rescale_q(time, kUnit, av_inv_q(clock_.rate));
+}
+
+int64_t PicturePacer::TickOf(int64_t time) {
+    const int64_t steps = GridIndex(time - *origin_);
+    const int64_t on_grid = *origin_ + av_rescale_q(steps, av_inv_q(clock_.rate), kUnit);
+    const int64_t tolerance = std::min(kGridTolerance, av_rescale_q(1, av_inv_q(clock_.rate), kUnit) / 8);
+    const int64_t value = std::abs(time - on_grid) <= tolerance
+                              ? av_rescale_q(*origin_, kUnit, clock_.tick) + steps * clock_.ticksPerPicture
+                              : av_rescale_q(time, kUnit, clock_.tick);
+    return lastTick_ ? std::max(value, *lastTick_ + 1) : value;
+}
+
+} // namespace writer

@@ -1,0 +1,65 @@
+// When each picture is shown in the file, and how often: stamps kept, or a steady rate made by leaving out
+// and repeating.
+#ifndef MOVIECONV_WRITER_PICTUREPACER_H
+#define MOVIECONV_WRITER_PICTUREPACER_H
+
+extern "C" {
+#include <libavutil/rational.h>
+}
+
+#include <cstdint>
+#include <optional>
+
+namespace writer {
+
+/// The fraction that a frame rate stands for: whole rates and those of the n/1001 family exactly, others as
+/// near as a fraction with terms up to 60000 comes. `rate` is a finite number above 0.
+AVRational ExactRate(double rate);
+
+/// The unit in which the times of pictures are written.
+struct PictureClock {
+    AVRational rate;     ///< Pictures per second.
+    AVRational tick;     ///< Length of a tick in seconds.
+    int ticksPerPicture; ///< Ticks in one picture at the rate.
+};
+
+/// Ticks fine enough for single stamps, or whole pictures where the container knows nothing else.
+PictureClock MakePictureClock(AVRational rate, bool wholePictures);
+
+/// Turns the times of pictures into ticks. A picture's showing is known when the next one has come, so each
+/// call answers for the picture before. Not thread-safe.
+class PicturePacer {
+public:
+    /// `keepStamps`: every picture is shown once at its own time, times that lie near the steady grid are put
+    /// on it; otherwise the grid is filled exactly.
+    PicturePacer(const PictureClock& clock, bool keepStamps);
+
+    /// `count` showings, the first at `tick`, each a picture after the one before; 0: not shown at all.
+    struct Showing {
+        int64_t tick = 0;
+        int64_t count = 0;
+    };
+
+    /// A picture whose time in the file is `time`, in 100 ns units, rising. Returns the showing of the one
+    /// before.
+    Showing Add(int64_t time);
+
+    /// Returns the showing of the last picture, which lasts until `end`.
+    Showing Finish(int64_t end);
+
+private:
+    int64_t TickOf(int64_t time);
+    int64_t GridIndex(int64_t time) const;
+    Showing ShowUntil(int64_t index);
+    Showing ShowOnce();
+
+    const PictureClock clock_;
+    const bool keepStamps_;
+    std::optional<int64_t> origin_;   ///< Time of the first picture.
+    std::optional<int64_t> lastTick_; ///< The last tick or grid index given out.
+    std::optional<int64_t> pending_;  ///< Tick or grid index of the picture whose showing is still open.
+};
+
+} // namespace writer
+
+#endif

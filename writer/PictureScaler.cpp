@@ -1,0 +1,152 @@
+#include "writer/PictureScaler.h"
+
+#include "writer/WriterFailure.h"
+#include "writer/WriterStatus.h"
+
+extern "C" {
+#include <libavutil/imgutils.h>
+#include <libavutil/pixdesc.h>
+}
+
+#include <algorithm>
+#include <cmath>
+#include <cstring>
+#include <new>
+
+namespace writer {
+namespace {
+
+constexpr int kAlignment = 64;
+
+int EvenDown(int value) {
+    return value & ~1;
+}
+
+/// Largest whole size at most `limit` in the proportion; at least 1.
+int Proportional(double value, int limit) {
+    return std::clamp(static_cast<int>(std::lround(value)), 1, limit);
+}
+
+void PaintBlack(AVFrame& frame, const PictureFit& fit, bool fullRange) {
+    if (fit.fittedWidth == fit.width && fit.fittedHeight == fit.height)
+        return;
+    ptrdiff_t linesize[4];
+    std::copy_n(frame.linesize, 4, linesize);
+    const AVColorRange range = fullRange ? AVCOL_RANGE_JPEG : AVCOL_RANGE_MPEG;
+    av_image_fill_black(frame.data, linesize, static_cast<AVPixelFormat>(frame.format), range, frame.width,
+                        frame.height);
+}
+
+/// Repeats the last column and row of a picture that is `padWidth` and `padHeight` smaller than its frame.
+void RepeatEdges(AVFrame& frame, int padWidth, int padHeight) {
+    // One more luma column or row never adds a chroma sample: 4:2:0 rounds up.
+    for (int row = 0; padWidth > 0 && row < frame.height; ++row) {
+        uint8_t* end = frame.data[0] + static_cast<ptrdiff_t>(row) * frame.linesize[0] + frame.width - 1;
+        end[0] = end[-1];
+    }
+    if (padHeight > 0) {
+        uint8_t* last = frame.data[0] + static_cast<ptrdiff_t>(frame.height - 1) * frame.linesize[0];
+        std::memcpy(last, last - frame.linesize[0], static_cast<size_t>(frame.width));
+    }
+}
+
+} // namespace
+
+PictureFit FitPicture(int width, int height, AVRational sampleAspect, int outWidth, int outHeight,
+                      bool stretch) {
+    if (sampleAspect.num <= 0 || sampleAspect.den <= 0)
+        sampleAspect = {1, 1};
+    PictureFit fit;
+    fit.width = fit.fittedWidth = outWidth;
+    fit.height = fit.fittedHeight = outHeight;
+    // Sizes are whole pixels: proportions that differ by less than one pixel are the same.
+    const double same_height = static_cast<double>(height) * outWidth / width;
+    const double same_width = static_cast<double>(width) * outHeight / height;
+    if (std::abs(same_height - outHeight) < 1 || std::abs(same_width - outWidth) < 1) {
+        fit.sampleAspect = sampleAspect;
+        return fit;
+    }
+    const double display = av_q2d(sampleAspect) * width / height;
+    if (stretch) {
+        const double shape = display * outHeight / outWidth;
+        fit.sampleAspect =
+            std::abs(display * outHeight - outWidth) < 1 ? AVRational{1, 1} : av_d2q(shape, 1000);
+        return fit;
+    }
+    if (display * outHeight <= outWidth)
+        fit.fittedWidth = Proportional(display * outHeight, outWidth);
+    else
+        fit.fittedHeight = Proportional(outWidth / display, outHeight);
+    fit.left = EvenDown((outWidth - fit.fittedWidth) / 2);
+    fit.top = EvenDown((outHeight - fit.fittedHeight) / 2);
+    return fit;
+}
+
+FramePool::~FramePool() {
+    av_buffer_pool_uninit(&pool_);
+}
+
+av::Frame FramePool::Get(AVPixelFormat format, int width, int height) {
+    if (pool_ == nullptr || format != format_ || width != width_ || height != height_) {
+        av_buffer_pool_uninit(&pool_);
+        const int size = av_image_get_buffer_size(format, FFALIGN(width, kAlignment), height, kAlignment);
+        pool_ = size < 0 ? nullptr : av_buffer_pool_init(static_cast<size_t>(size) + kAlignment, nullptr);
+        format_ = format;
+        width_ = width;
+        height_ = height;
+    }
+    av::Frame frame(av_frame_alloc());
+    if (!frame || pool_ == nullptr)
+        throw std::bad_alloc();
+    frame->buf[0] = av_buffer_pool_get(pool_);
+    if (frame->buf[0] == nullptr)
+        throw std::bad_alloc();
+    frame->format = format;
+    frame->width = width;
+    frame->height = height;
+    av_image_fill_arrays(frame->data, frame->linesize, frame->buf[0]->data, format,
+                         FFALIGN(width, kAlignment), height, kAlignment);
+    return frame;
+}
+
+PictureScaler::PictureScaler(const Output& output, AVRational sampleAspect, bool stretch,
+                             bool sourceFullRange)
+    : output_(output), sampleAspect_(sampleAspect), stretch_(stretch), sourceFullRange_(sourceFullRange) {}
+
+av::Frame PictureScaler::Convert(av::Frame picture) {
+    const bool padded = output_.padWidth > 0 || output_.padHeight > 0;
+    const bool same_format = picture->format == output_.format && sourceFullRange_ == output_.fullRange;
+    if (same_format && !padded && picture->width == output_.width && picture->height == output_.height)
+        return picture;
+    PrepareFor(*picture);
+    av::Frame frame =
+        pool_.Get(output_.format, output_.width + output_.padWidth, output_.height + output_.padHeight);
+    av_frame_copy_props(frame.get(), picture.get());
+    PaintBlack(*frame, fit_, output_.fullRange);
+    uint8_t* planes[4] = {frame->data[0] + static_cast<ptrdiff_t>(fit_.top) * frame->linesize[0] + fit_.left};
+    for (int plane = 1; plane < 3; ++plane)
+        planes[plane] = frame->data[plane] + static_cast<ptrdiff_t>(fit_.top / 2) * frame->linesize[plane] +
+                        fit_.left / 2;
+    sws_scale(scaler_.get(), picture->data, picture->linesize, 0, picture->height, planes, frame->linesize);
+    RepeatEdges(*frame, output_.padWidth, output_.padHeight);
+    return frame;
+}
+
+void PictureScaler::PrepareFor(const AVFrame& picture) {
+    if (scaler_ && picture.width == sourceWidth_ && picture.height == sourceHeight_)
+        return;
+    sourceWidth_ = picture.width;
+    sourceHeight_ = picture.height;
+    fit_ = FitPicture(picture.width, picture.height, sampleAspect_, output_.width, output_.height, stretch_);
+    scaler_.reset(sws_getContext(picture.width, picture.height, static_cast<AVPixelFormat>(picture.format),
+                                 fit_.fittedWidth, fit_.fittedHeight, output_.format,
+                                 SWS_BICUBIC | SWS_ACCURATE_RND | SWS_BITEXACT, nullptr, nullptr, nullptr));
+    if (!scaler_)
+        throw WriterFailure(kWriterErrorEncode, "Pictures of " + std::to_string(picture.width) + "x" +
+                                                    std::to_string(picture.height) + " cannot be scaled.");
+    const int* matrix = sws_getCoefficients(SWS_CS_DEFAULT);
+    sws_setColorspaceDetails(scaler_.get(), matrix, sourceFullRange_ ? 1 : 0, matrix,
+                             output_.fullRange ? 1 : 0, 0, 1 << 16, 1 << 16);
+}
+
+} // namespace writer

@@ -1,0 +1,93 @@
+#include "writer/PictureStage.h"
+
+extern "C" {
+#include <libavutil/imgutils.h>
+}
+
+#include <optional>
+#include <utility>
+
+namespace writer {
+namespace {
+
+constexpr size_t kMostPictures = 8;
+constexpr size_t kMostBytes = size_t{64} << 20;
+
+size_t ByteSize(const VideoImage& image) {
+    return static_cast<size_t>(image.nWidth) * static_cast<size_t>(image.nHeight) * 3 / 2;
+}
+
+av::Frame CopyPicture(FramePool& pool, const VideoImage& image) {
+    av::Frame frame = pool.Get(AV_PIX_FMT_YUV420P, image.nWidth, image.nHeight);
+    const int chroma_width = (image.nWidth + 1) / 2;
+    const int chroma_height = (image.nHeight + 1) / 2;
+    av_image_copy_plane(frame->data[0], frame->linesize[0], image.pY, image.nPitchY, image.nWidth,
+                        image.nHeight);
+    av_image_copy_plane(frame->data[1], frame->linesize[1], image.pU, image.nPitchU, chroma_width,
+                        chroma_height);
+    av_image_copy_plane(frame->data[2], frame->linesize[2], image.pV, image.nPitchV, chroma_width,
+                        chroma_height);
+    return frame;
+}
+
+} // namespace
+
+PictureStage::PictureStage(const VideoPlan& plan, EncoderFlags flags)
+    : plan_(plan),
+      encoder_(*plan.codec, plan.settings, flags, plan.clock.ticksPerPicture),
+      pacer_(plan.clock, plan.keepStamps),
+      scaler_(plan.picture, plan.sourceAspect, plan.stretch, plan.sourceFullRange),
+      queue_(kMostPictures, kMostBytes) {}
+
+PictureStage::~PictureStage() {
+    Cancel();
+    Join();
+}
+
+void PictureStage::Start(PacketTaker take, Shown shown, StageFailure failed) {
+    take_ = std::move(take);
+    shown_ = std::move(shown);
+    thread_ = std::thread([this, failed = std::move(failed)] {
+        try {
+            Run();
+        } catch (...) {
+            failed(std::current_exception());
+        }
+    });
+}
+
+bool PictureStage::Push(const VideoImage& image, int64_t time) {
+    av::Frame frame = CopyPicture(pool_, image);
+    frame->pts = time;
+    return queue_.Push(std::move(frame), ByteSize(image));
+}
+
+void PictureStage::Join() {
+    if (thread_.joinable())
+        thread_.join();
+}
+
+void PictureStage::Run() {
+    int64_t end = 0;
+    while (std::optional<av::Frame> frame = queue_.Pop()) {
+        const int64_t time = (*frame)->pts;
+        end = time + plan_.pictureLength;
+        Show(pacer_.Add(time));
+        current_ = std::move(*frame);
+    }
+    Show(pacer_.Finish(end));
+    encoder_.Finish(take_);
+}
+
+void PictureStage::Show(const PicturePacer::Showing& showing) {
+    if (!current_)
+        return;
+    shown_(showing.count);
+    if (showing.count == 0)
+        return;
+    const av::Frame picture = scaler_.Convert(std::move(current_));
+    for (int64_t i = 0; i < showing.count; ++i)
+        encoder_.Encode(*picture, showing.tick + i * plan_.clock.ticksPerPicture, take_);
+}
+
+} // namespace writer

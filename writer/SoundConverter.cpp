@@ -1,0 +1,175 @@
+#include "writer/SoundConverter.h"
+
+#include "writer/WriterFailure.h"
+#include "writer/WriterStatus.h"
+
+#include <algorithm>
+#include <new>
+#include <string>
+#include <utility>
+
+namespace writer {
+namespace {
+
+constexpr int kMostChannels = 64;
+constexpr int kMostRate = 768'000;
+constexpr int kFramesAtOnce = 16384;
+
+AVSampleFormat SampleFormatOf(int bits) {
+    switch (bits) {
+    case 8:
+        return AV_SAMPLE_FMT_U8;
+    case 16:
+        return AV_SAMPLE_FMT_S16;
+    default:
+        return AV_SAMPLE_FMT_S32;
+    }
+}
+
+/// How many of the channels are used: all, or the first two as stereo where that many have no usual meaning.
+int UsedChannels(const PcmFormat& format) {
+    const av::ChannelLayout usual(format.channels);
+    return usual.Get()->order == AV_CHANNEL_ORDER_UNSPEC ? 2 : format.channels;
+}
+
+/// Takes the first `channels` channels; 24-bit samples go into the upper bytes of 32-bit ones.
+void Repack(const PcmFormat& format, int channels, const uint8_t* data, int frames,
+            std::vector<uint8_t>& out) {
+    const size_t from_size = format.bits / 8;
+    const size_t to_size = format.bits == 24 ? 4 : from_size;
+    out.assign(static_cast<size_t>(frames) * channels * to_size, 0);
+    uint8_t* to = out.data() + (to_size - from_size);
+    for (int frame = 0; frame < frames; ++frame, data += format.BytesPerFrame()) {
+        for (int channel = 0; channel < channels; ++channel, to += to_size)
+            std::copy_n(data + channel * from_size, from_size, to);
+    }
+}
+
+[[noreturn]] void ThrowUnconvertible(const PcmFormat& format, int error) {
+    throw WriterFailure(kWriterErrorEncode, "Sound of " + std::to_string(format.rate) + " Hz with " +
+                                                std::to_string(format.channels) + " channels of " +
+                                                std::to_string(format.bits) +
+                                                " bits cannot be converted: " + av::ErrorText(error) + ".");
+}
+
+} // namespace
+
+bool PcmFormat::Valid() const {
+    return rate > 0 && rate <= kMostRate && channels > 0 && channels <= kMostChannels &&
+           (bits == 8 || bits == 16 || bits == 24 || bits == 32);
+}
+
+SoundConverter::SoundConverter(int rate, const AVChannelLayout& layout, AVSampleFormat format)
+    : rate_(rate), format_(format), fifo_(av_audio_fifo_alloc(format, layout.nb_channels, 4096)) {
+    if (!fifo_ || av_channel_layout_copy(layout_.Get(), &layout) < 0)
+        throw std::bad_alloc();
+}
+
+void SoundConverter::Push(const PcmFormat& format, const uint8_t* data, size_t size) {
+    if (!(format == source_))
+        Prepare(format);
+    const auto frame_size = static_cast<size_t>(format.BytesPerFrame());
+    if (!rest_.empty()) {
+        const size_t missing = std::min(frame_size - rest_.size(), size);
+        rest_.insert(rest_.end(), data, data + missing);
+        data += missing;
+        size -= missing;
+        if (rest_.size() < frame_size)
+            return;
+        const std::vector<uint8_t> whole = std::exchange(rest_, {});
+        Convert(whole.data(), 1);
+    }
+    const size_t frames = size / frame_size;
+    for (size_t done = 0; done < frames; done += kFramesAtOnce) {
+        const size_t count = std::min<size_t>(kFramesAtOnce, frames - done);
+        Convert(data + done * frame_size, static_cast<int>(count));
+    }
+    rest_.assign(data + frames * frame_size, data + size);
+}
+
+void SoundConverter::PushSilence(int64_t samples) {
+    while (samples > 0) {
+        const int count = static_cast<int>(std::min<int64_t>(samples, kFramesAtOnce));
+        const av::Frame frame = NewFrame(count);
+        av_samples_set_silence(frame->extended_data, 0, count, layout_.Channels(), format_);
+        if (av_audio_fifo_write(fifo_.get(), reinterpret_cast<void**>(frame->extended_data), count) < count)
+            throw std::bad_alloc();
+        samples -= count;
+    }
+}
+
+void SoundConverter::Finish() {
+    Drain();
+    rest_.clear();
+    source_ = {};
+}
+
+av::Frame SoundConverter::Take(int samples) {
+    av::Frame frame = NewFrame(samples);
+    if (av_audio_fifo_read(fifo_.get(), reinterpret_cast<void**>(frame->extended_data), samples) < samples)
+        throw WriterFailure(kWriterErrorInternal, "The sound buffer holds less than it said.");
+    return frame;
+}
+
+/// Makes a resampler for `format`; what the one before still holds comes first.
+void SoundConverter::Prepare(const PcmFormat& format) {
+    Finish();
+    av::ChannelLayout source(UsedChannels(format));
+    SwrContext* made = nullptr;
+    int error = swr_alloc_set_opts2(&made, layout_.Get(), format_, rate_, source.Get(),
+                                    SampleFormatOf(format.bits), format.rate, 0, nullptr);
+    resampler_.reset(made);
+    if (error >= 0)
+        error = swr_init(made);
+    if (error < 0)
+        ThrowUnconvertible(format, error);
+    source_ = format;
+}
+
+void SoundConverter::Convert(const uint8_t* data, int frames) {
+    const int channels = UsedChannels(source_);
+    if (source_.bits == 24 || channels != source_.channels) {
+        Repack(source_, channels, data, frames, repacked_);
+        data = repacked_.data();
+    }
+    const av::Frame frame = NewFrame(std::max(1, swr_get_out_samples(resampler_.get(), frames)));
+    const uint8_t* const input[AV_NUM_DATA_POINTERS] = {data};
+    const int made = swr_convert(resampler_.get(), frame->extended_data, frame->nb_samples,
+                                 const_cast<const uint8_t**>(input), frames);
+    if (made < 0)
+        ThrowUnconvertible(source_, made);
+    if (av_audio_fifo_write(fifo_.get(), reinterpret_cast<void**>(frame->extended_data), made) < made)
+        throw std::bad_alloc();
+}
+
+void SoundConverter::Drain() {
+    if (!resampler_)
+        return;
+    for (;;) {
+        const int left = swr_get_out_samples(resampler_.get(), 0);
+        if (left <= 0)
+            break;
+        const av::Frame frame = NewFrame(left);
+        const int made = swr_convert(resampler_.get(), frame->extended_data, left, nullptr, 0);
+        if (made <= 0)
+            break;
+        if (av_audio_fifo_write(fifo_.get(), reinterpret_cast<void**>(frame->extended_data), made) < made)
+            throw std::bad_alloc();
+    }
+    resampler_.reset();
+}
+
+av::Frame SoundConverter::NewFrame(int samples) const {
+    av::Frame frame(av_frame_alloc());
+    if (!frame)
+        throw std::bad_alloc();
+    frame->nb_samples = samples;
+    frame->format = format_;
+    frame->sample_rate = rate_;
+    if (av_channel_layout_copy(&frame->ch_layout, layout_.Get()) < 0 ||
+        av_frame_get_buffer(frame.get(), 0) < 0)
+        throw std::bad_alloc();
+    return frame;
+}
+
+} // namespace writer
