@@ -1,0 +1,90 @@
+# Install rules, the CMake and pkg-config packages, and the Debian package.
+#
+# The engine, its companions and the program lie in one folder of their own, <libdir>/movieconv, where they find each
+# other by $ORIGIN; <bindir> and <libdir> hold links to the program and to the engine. The links lead to the real files
+# before $ORIGIN is taken, but for the engine's, which is why its run path names the folder as well.
+if(NOT TARGET orvex)
+  message(STATUS "No media writer: this build cannot be installed")
+  return()
+endif()
+
+include(CMakePackageConfigHelpers)
+
+set(home_dir ${CMAKE_INSTALL_LIBDIR}/movieconv)
+set(header_dir ${CMAKE_INSTALL_INCLUDEDIR}/movieconv)
+set(doc_dir ${CMAKE_INSTALL_DATAROOTDIR}/doc/movieconv)
+set(package_dir ${CMAKE_INSTALL_LIBDIR}/cmake/MovieConv)
+
+# api/MovieConv.h with what it includes, and what a host may include beside it.
+target_sources(movieconv PUBLIC FILE_SET HEADERS BASE_DIRS ${PROJECT_SOURCE_DIR} FILES
+  ${PROJECT_SOURCE_DIR}/Common/Image/ImageConvert.h
+  ${PROJECT_SOURCE_DIR}/api/MovieConv.h
+  ${PROJECT_SOURCE_DIR}/engine/AudioHelpers.h
+  ${PROJECT_SOURCE_DIR}/engine/PostMessage.h
+  ${PROJECT_SOURCE_DIR}/engine/ProgressInfo.h
+  ${PROJECT_SOURCE_DIR}/logsink/LogSink.h
+  ${PROJECT_SOURCE_DIR}/media/Decoders.h
+  ${PROJECT_SOURCE_DIR}/media/EncodeParam.h
+  ${PROJECT_SOURCE_DIR}/media/FourCC.h
+  ${PROJECT_SOURCE_DIR}/media/MediaRecords.h
+  ${PROJECT_SOURCE_DIR}/media/MediaWriter.h
+  ${PROJECT_SOURCE_DIR}/media/ProgressCallback.h
+  ${PROJECT_SOURCE_DIR}/platform/Platform.h
+  ${PROJECT_SOURCE_DIR}/thread/TimeData.h
+  ${PROJECT_SOURCE_DIR}/writer/WriterStatus.h)
+
+install(TARGETS movieconv platform orvex quennet EXPORT MovieConvTargets
+  LIBRARY DESTINATION ${home_dir}
+  FILE_SET HEADERS DESTINATION ${header_dir})
+if(TARGET movieconv_host)
+  install(TARGETS movieconv_host RUNTIME DESTINATION ${home_dir})
+endif()
+
+# install_link(FOLDER NAME TARGET): a link NAME in FOLDER to TARGET, both of the installed tree.
+function(install_link folder name target)
+  file(RELATIVE_PATH path ${CMAKE_INSTALL_PREFIX}/${folder} ${CMAKE_INSTALL_PREFIX}/${target})
+  file(MAKE_DIRECTORY ${CMAKE_BINARY_DIR}/install-links/${folder})
+  file(CREATE_LINK ${path} ${CMAKE_BINARY_DIR}/install-links/${folder}/${name} SYMBOLIC)
+  install(FILES ${CMAKE_BINARY_DIR}/install-links/${folder}/${name} DESTINATION ${folder})
+endfunction()
+install_link(${CMAKE_INSTALL_BINDIR} movieconv ${home_dir}/movieconv)
+install_link(${CMAKE_INSTALL_LIBDIR} libmovieconv.so.${PROJECT_VERSION_MAJOR}
+             ${home_dir}/libmovieconv.so.${PROJECT_VERSION_MAJOR})
+install_link(${CMAKE_INSTALL_LIBDIR} libmovieconv.so ${home_dir}/libmovieconv.so)
+
+install(FILES host/movieconv.1 DESTINATION ${CMAKE_INSTALL_MANDIR}/man1 OPTIONAL)
+install(FILES README.md CHANGELOG.md docs/abi.md docs/api.md docs/architecture.md
+  DESTINATION ${doc_dir} OPTIONAL)
+install(FILES LICENSE DESTINATION ${doc_dir} RENAME copyright)
+install(DIRECTORY examples/ DESTINATION ${doc_dir}/examples)
+
+# find_package(MovieConv)
+install(EXPORT MovieConvTargets NAMESPACE MovieConv:: DESTINATION ${package_dir})
+configure_package_config_file(cmake/MovieConvConfig.cmake.in ${CMAKE_BINARY_DIR}/MovieConvConfig.cmake
+  INSTALL_DESTINATION ${package_dir})
+write_basic_package_version_file(${CMAKE_BINARY_DIR}/MovieConvConfigVersion.cmake COMPATIBILITY SameMajorVersion)
+install(FILES ${CMAKE_BINARY_DIR}/MovieConvConfig.cmake ${CMAKE_BINARY_DIR}/MovieConvConfigVersion.cmake
+  DESTINATION ${package_dir})
+
+# pkg-config movieconv
+set(pkgconfig_dir ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
+file(RELATIVE_PATH MOVIECONV_PREFIX_FROM_PC ${CMAKE_INSTALL_PREFIX}/${pkgconfig_dir} ${CMAKE_INSTALL_PREFIX})
+string(REGEX REPLACE "/$" "" MOVIECONV_PREFIX_FROM_PC ${MOVIECONV_PREFIX_FROM_PC})
+configure_file(cmake/movieconv.pc.in ${CMAKE_BINARY_DIR}/movieconv.pc @ONLY)
+install(FILES ${CMAKE_BINARY_DIR}/movieconv.pc DESTINATION ${pkgconfig_dir})
+
+# cpack
+set(CPACK_GENERATOR DEB)
+set(CPACK_PACKAGE_NAME movieconv)
+set(CPACK_PACKAGE_VENDOR "MovieConv")
+set(CPACK_PACKAGE_CONTACT "MovieConv maintainers <movieconv@localhost>")
+set(CPACK_PACKAGE_DESCRIPTION_SUMMARY "movie converter: engine, media writer and program")
+set(CPACK_PACKAGE_DESCRIPTION
+  "A movie-conversion engine as a shared library with its media writer over the FFmpeg libraries, bit-exact colour
+conversion routines, the headers to build against them, and the command-line program movieconv.")
+set(CPACK_STRIP_FILES ON)
+set(CPACK_DEBIAN_FILE_NAME DEB-DEFAULT)
+set(CPACK_DEBIAN_PACKAGE_SECTION video)
+set(CPACK_DEBIAN_PACKAGE_SHLIBDEPS ON)
+set(CPACK_DEBIAN_PACKAGE_SHLIBDEPS_PRIVATE_DIRS ${CMAKE_LIBRARY_OUTPUT_DIRECTORY})
+include(CPack)
