@@ -1,9 +1,16 @@
 #include "Common/Image/kernels/RowKernels.h"
 
 #include <algorithm>
+#include <atomic>
 #include <iterator>
 
 namespace image {
+namespace {
+
+/// What the routines use; null until the first of them asks.
+std::atomic<const RowKernels*> g_kernels{nullptr};
+
+} // namespace
 
 const RowKernels* RowKernelsFor(KernelLevel level) {
     switch (level) {
@@ -21,11 +28,17 @@ const RowKernels* RowKernelsFor(KernelLevel level) {
 }
 
 const RowKernels& BestRowKernels() {
-    static const RowKernels* const best = [] {
-        const auto found = std::find_if(std::rbegin(kKernelLevels), std::rend(kKernelLevels), RowKernelsFor);
-        return RowKernelsFor(*found);
-    }();
-    return *best;
+    const RowKernels* kernels = g_kernels.load(std::memory_order_relaxed);
+    if (kernels == nullptr) {
+        const auto best = std::find_if(std::rbegin(kKernelLevels), std::rend(kKernelLevels), RowKernelsFor);
+        kernels = RowKernelsFor(*best);
+        g_kernels.store(kernels, std::memory_order_relaxed);
+    }
+    return *kernels;
+}
+
+void ForceRowKernels(KernelLevel level) {
+    g_kernels.store(RowKernelsFor(level), std::memory_order_relaxed);
 }
 
 } // namespace image

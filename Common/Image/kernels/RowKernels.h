@@ -71,8 +71,12 @@ inline constexpr KernelLevel kKernelLevels[] = {KernelLevel::kPlain, KernelLevel
 /// The kernels of one level; null when the processor or this build lacks it.
 const RowKernels* RowKernelsFor(KernelLevel level);
 
-/// The kernels of the highest level there is, chosen once.
+/// The kernels of the highest level there is, chosen once, or of the level that was forced.
 const RowKernels& BestRowKernels();
+
+/// Makes every later call of a routine use one level, so that tests and benchmarks can compare levels. A
+/// level that the processor lacks gives the choice back.
+void ForceRowKernels(KernelLevel level);
 
 /// The tables, one a file. Only RowKernelsFor says whether the processor can run them.
 extern const RowKernels kPlainKernels;
