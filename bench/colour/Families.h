@@ -1,0 +1,35 @@
+// The colour routines that are measured, each with the nearest call of libyuv.
+#ifndef MOVIECONV_BENCH_COLOUR_FAMILIES_H
+#define MOVIECONV_BENCH_COLOUR_FAMILIES_H
+
+#include "bench/colour/Pictures.h"
+
+#include <array>
+#include <span>
+
+namespace bench {
+
+constexpr int kSizes[][2] = {{640, 480}, {1920, 1080}, {3840, 2160}};
+
+/// How much faster than the peer a routine shall be at each of `kSizes`; zeroes where nothing is asked.
+using Goals = std::array<double, std::size(kSizes)>;
+
+/// What a routine does to the samples: whether it computes, and so gains from vectors, and from which cube of
+/// inputs.
+enum class Kind { RgbToYuv, YuvToRgb, Average, Move };
+
+struct Family {
+    const char* name;
+    Kind kind;
+    void (*ours)(Pictures&);
+    const char* peerName;
+    void (*peer)(Pictures&);
+    Goals goalsAvx2;
+    Goals goalsAvx512;
+};
+
+std::span<const Family> families();
+
+} // namespace bench
+
+#endif
