@@ -6,6 +6,8 @@
 // inline function for each instruction, defined without linkage in the file that makes the table, so that
 // nothing compiled for one instruction set is shared with another.
 //
+// Every kernel is flattened: one loop without a call, its constants in registers.
+//
 // Widths: whole blocks, then the last whole block of an even width once more over what has been written,
 // which gives the same bytes. Rows shorter than a block go to the next lower level, an odd last column to the
 // plain kernels.
@@ -34,18 +36,19 @@ class LaneKernels {
     // ------------------------------------------------------------------------------------------------------
 
     /// Calls block(x) so that all columns of an even width are covered; returns how many are: all, or none of
-    /// a row that is too short.
+    /// a row that is too short. One place calls the block, so that the compiler keeps its constants in
+    /// registers.
     template <class Block>
     static ptrdiff_t ForBlocks(ptrdiff_t width, ptrdiff_t blockPixels, Block block) {
         const ptrdiff_t even = width & ~ptrdiff_t{1};
-        if (even < blockPixels)
+        const ptrdiff_t last = even - blockPixels;
+        if (last < 0)
             return 0;
-        ptrdiff_t x = 0;
-        for (; x + blockPixels <= even; x += blockPixels)
+        for (ptrdiff_t x = 0;; x = x + blockPixels < last ? x + blockPixels : last) {
             block(x);
-        if (x < even)
-            block(even - blockPixels);
-        return even;
+            if (x == last)
+                return even;
+        }
     }
 
     /// What converts the columns from `done` on.
@@ -211,8 +214,8 @@ class LaneKernels {
     }
 
     template <class Format, class Form, To420 RowKernels::*kRest>
-    static void RgbTo420(RowPair<uint8_t> y, uint8_t* u, uint8_t* v, RowPair<const uint8_t> rgb,
-                         ptrdiff_t width) {
+    [[gnu::flatten]] static void RgbTo420(RowPair<uint8_t> y, uint8_t* u, uint8_t* v,
+                                          RowPair<const uint8_t> rgb, ptrdiff_t width) {
         const ptrdiff_t done = ForBlocks(width, kPixels, [&](ptrdiff_t x) {
             RgbBlockTo420<Format, Form>(Advance(y, x), u + x / 2, v + x / 2,
                                         Advance(rgb, Format::kBytes * x));
@@ -222,8 +225,8 @@ class LaneKernels {
                                 Advance(rgb, Format::kBytes * done), width - done);
     }
 
-    static void RgbaTo420(RowPair<uint8_t> y, uint8_t* u, uint8_t* v, RowPair<uint8_t> alpha,
-                          RowPair<const uint8_t> rgba, ptrdiff_t width) {
+    [[gnu::flatten]] static void RgbaTo420(RowPair<uint8_t> y, uint8_t* u, uint8_t* v, RowPair<uint8_t> alpha,
+                                           RowPair<const uint8_t> rgba, ptrdiff_t width) {
         const ptrdiff_t done = ForBlocks(width, kPixels, [&](ptrdiff_t x) {
             RgbBlockTo420<Bgr32, FastRgbForm>(Advance(y, x), u + x / 2, v + x / 2, Advance(rgba, 4 * x));
             V::Store(alpha.first + x, Bgr32::Alpha(rgba.first + 4 * x));
@@ -348,8 +351,8 @@ class LaneKernels {
     };
 
     template <class Target, class Form, From420 RowKernels::*kRest>
-    static void RgbFrom420(RowPair<uint8_t> rgb, RowPair<const uint8_t> y, const uint8_t* u, const uint8_t* v,
-                           ptrdiff_t width) {
+    [[gnu::flatten]] static void RgbFrom420(RowPair<uint8_t> rgb, RowPair<const uint8_t> y, const uint8_t* u,
+                                            const uint8_t* v, ptrdiff_t width) {
         const ptrdiff_t done = ForBlocks(width, kPixels, [&](ptrdiff_t x) {
             const ChromaTerms terms = MakeTerms<Form>(V::LoadWords(u + x / 2), V::LoadWords(v + x / 2));
             Target::Store(rgb.first + Target::kBytes * x, FromPlanarLuma<Form>(V::Load(y.first + x), terms));
@@ -386,8 +389,8 @@ class LaneKernels {
     }
 
     template <PackedOrder kOrder>
-    static void PackedTo420(RowPair<uint8_t> y, uint8_t* u, uint8_t* v, RowPair<const uint8_t> packed,
-                            ptrdiff_t width) {
+    [[gnu::flatten]] static void PackedTo420(RowPair<uint8_t> y, uint8_t* u, uint8_t* v,
+                                             RowPair<const uint8_t> packed, ptrdiff_t width) {
         const ptrdiff_t done = ForBlocks(width, kPixels, [&](ptrdiff_t x) {
             Vec lumaFirst[2];
             Vec lumaSecond[2];
@@ -411,8 +414,8 @@ class LaneKernels {
     }
 
     template <PackedOrder kOrder>
-    static void PackedFrom420(RowPair<uint8_t> packed, RowPair<const uint8_t> y, const uint8_t* u,
-                              const uint8_t* v, ptrdiff_t width) {
+    [[gnu::flatten]] static void PackedFrom420(RowPair<uint8_t> packed, RowPair<const uint8_t> y,
+                                               const uint8_t* u, const uint8_t* v, ptrdiff_t width) {
         const ptrdiff_t done = ForBlocks(width, kPixels, [&](ptrdiff_t x) {
             const Vec uv = V::Or(V::LoadWords(u + x / 2), V::template Sll16<8>(V::LoadWords(v + x / 2)));
             StorePacked<kOrder>(packed.first + 2 * x, V::Load(y.first + x), uv);
@@ -424,7 +427,7 @@ class LaneKernels {
     }
 
     template <PackedOrder kOrder>
-    static void PackedFromBgr24(uint8_t* packed, const uint8_t* rgb, ptrdiff_t width) {
+    [[gnu::flatten]] static void PackedFromBgr24(uint8_t* packed, const uint8_t* rgb, ptrdiff_t width) {
         constexpr LaneBytes kUvOrder{0, 8, 4, 12, 1, 9, 5, 13, 2, 10, 6, 14, 3, 11, 7, 15};
         const ptrdiff_t done = ForBlocks(width, kPixels, [&](ptrdiff_t x) {
             const Pixels pixels = Bgr24::Load(rgb + 3 * x);
@@ -436,7 +439,7 @@ class LaneKernels {
     }
 
     template <PackedOrder kOrder>
-    static void Bgr24FromPacked(uint8_t* rgb, const uint8_t* packed, ptrdiff_t width) {
+    [[gnu::flatten]] static void Bgr24FromPacked(uint8_t* rgb, const uint8_t* packed, ptrdiff_t width) {
         using Form = FastYuvForm;
         const ptrdiff_t done = ForBlocks(width, kPixels, [&](ptrdiff_t x) {
             const Vec halves[2] = {V::LoadLanes(packed + 2 * x, 32), V::LoadLanes(packed + 2 * x + 16, 32)};
@@ -452,7 +455,7 @@ class LaneKernels {
             Rest(done).bgr24FromPacked[kOrder](rgb + 3 * done, packed + 2 * done, width - done);
     }
 
-    static void SwapPacked(uint8_t* target, const uint8_t* source, ptrdiff_t width) {
+    [[gnu::flatten]] static void SwapPacked(uint8_t* target, const uint8_t* source, ptrdiff_t width) {
         constexpr LaneBytes kSwapped{1, 0, 3, 2, 5, 4, 7, 6, 9, 8, 11, 10, 13, 12, 15, 14};
         const ptrdiff_t done = ForBlocks(width, kPixels / 2, [&](ptrdiff_t x) {
             V::Store(target + 2 * x, V::Shuffle8(V::Load(source + 2 * x), V::Lane(kSwapped)));
@@ -464,7 +467,7 @@ class LaneKernels {
     // --- Planes
     // ------------------------------------------------------------------------------------------------------
 
-    static void Halve(uint8_t* target, RowPair<const uint8_t> source, ptrdiff_t width) {
+    [[gnu::flatten]] static void Halve(uint8_t* target, RowPair<const uint8_t> source, ptrdiff_t width) {
         const auto average = [](const uint8_t* first, const uint8_t* second) {
             const Vec ones = V::Set8(1);
             return V::template Srl16<2>(V::Add16(V::MulAddU8S8(V::LoadLanes(first, 32), ones),
@@ -479,7 +482,7 @@ class LaneKernels {
             Rest(done).halve(target + done / 2, Advance(source, done), width - done);
     }
 
-    static void Doubled(RowPair<uint8_t> target, const uint8_t* source, ptrdiff_t width) {
+    [[gnu::flatten]] static void Doubled(RowPair<uint8_t> target, const uint8_t* source, ptrdiff_t width) {
         const ptrdiff_t done = ForBlocks(width, kPixels, [&](ptrdiff_t x) {
             const Vec samples = V::Load(source + x);
             const Vec low = V::UnpackLo8(samples, samples);
