@@ -56,10 +56,6 @@ int64_t StampNormaliser::PlaceFirst(int64_t stamp) {
     int64_t time = 0;
     if (reference_) {
         time = reference_->position + (stamp - reference_->stamp);
-        if (time > SoundLength() + kFarthestAhead) {
-            time = 0;
-            ++repairs_;
-        }
         if (!soundStart_)
             soundStart_ = std::max<int64_t>(0, -time);
     } else if (SoundLength() > 0) {

@@ -1,0 +1,231 @@
+#include "writer/StampNormaliser.h"
+#include "EngineModel.h"
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <cmath>
+#include <cstdlib>
+#include <optional>
+#include <random>
+#include <string>
+
+namespace {
+
+using writer::StampNormaliser;
+
+constexpr int64_t kSecond = 10'000'000;
+constexpr int64_t kMillisecond = 10'000;
+
+/// What the normaliser makes of one clip.
+struct Placed {
+    std::vector<int64_t> times;   ///< Of the pictures.
+    std::vector<int64_t> sources; ///< The pictures' true times.
+    int64_t soundStart = 0;
+    int64_t soundLength = 0;
+    std::optional<int64_t> realSource;   ///< True time of the first real block.
+    std::optional<int64_t> realPosition; ///< Its place by the count of samples.
+    bool pictureAfterReal = false;       ///< Without one, nothing tells where the sound belongs.
+};
+
+Placed Place(const ModelClip& clip, const ModelSource& source) {
+    StampNormaliser stamps(source.PictureLength(), true);
+    Placed placed;
+    for (const ModelEvent& event : clip) {
+        if (event.picture) {
+            placed.times.push_back(stamps.AddPicture(event.stamp));
+            placed.sources.push_back(event.source);
+            placed.pictureAfterReal = placed.realSource.has_value();
+            continue;
+        }
+        if (!event.silence && !placed.realSource) {
+            placed.realSource = event.source;
+            placed.realPosition = stamps.SoundLength();
+        }
+        stamps.AddSound(event.stamp, event.bytes, int64_t{source.sampleRate} * 4, event.silence);
+        const std::optional<int64_t> known = stamps.SoundStart();
+        if (known)
+            placed.soundStart = *known;
+    }
+    stamps.Finish();
+    EXPECT_TRUE(stamps.SoundStart().has_value());
+    placed.soundStart = *stamps.SoundStart();
+    placed.soundLength = stamps.SoundLength();
+    return placed;
+}
+
+/// The properties that hold for every clip of a source whose sound has no holes.
+void CheckClip(const ModelClip& clip, const ModelSource& source, const std::string& what) {
+    SCOPED_TRACE(what);
+    const Placed placed = Place(clip, source);
+    const int64_t picture = source.PictureLength();
+    int64_t bytes = 0;
+    for (const ModelEvent& event : clip)
+        bytes += event.bytes;
+    EXPECT_NEAR(static_cast<double>(placed.soundLength), bytes * 1e7 / (source.sampleRate * 4.0), 2.0);
+    if (placed.times.empty())
+        return;
+    EXPECT_GE(placed.times.front(), 0);
+    EXPECT_GE(placed.soundStart, 0);
+    const int64_t begin =
+        bytes > 0 ? std::min(placed.times.front(), placed.soundStart) : placed.times.front();
+    EXPECT_LE(begin, picture) << "nothing begins near 0";
+    for (size_t i = 1; i < placed.times.size(); ++i) {
+        ASSERT_GT(placed.times[i], placed.times[i - 1]) << "picture " << i;
+        ASSERT_NEAR(placed.times[i] - placed.times[i - 1], placed.sources[i] - placed.sources[i - 1], picture)
+            << "picture " << i;
+    }
+    if (!placed.pictureAfterReal)
+        return;
+    const int64_t real_time = placed.soundStart + *placed.realPosition;
+    for (size_t i = 0; i < placed.times.size(); ++i) {
+        const int64_t distance = placed.times[i] - real_time;
+        const int64_t truth = placed.sources[i] - *placed.realSource;
+        ASSERT_LT(std::abs(distance - truth), picture) << "picture " << i;
+    }
+}
+
+void CheckAllClips(const ModelSource& source, const std::string& what) {
+    const std::vector<ModelClip> clips = RunEngineModel(source);
+    for (size_t i = 0; i < clips.size(); ++i)
+        CheckClip(clips[i], source, what + " clip " + std::to_string(i));
+}
+
+struct Case {
+    const char* name;
+    double fps;
+    int blockSamples;
+    int64_t offset;
+    double soundSeconds;
+    int split;
+};
+
+class KnownCases : public testing::TestWithParam<Case> {};
+
+TEST_P(KnownCases, KeepPicturesAndSoundTogether) {
+    const Case& known = GetParam();
+    ModelSource source;
+    source.fps = known.fps;
+    source.pictures = static_cast<int>(known.fps * 10);
+    source.blockSamples = known.blockSamples;
+    source.soundOffset = known.offset;
+    source.soundSeconds = known.soundSeconds;
+    source.splitMilliseconds = known.split;
+    CheckAllClips(source, known.name);
+}
+
+constexpr Case kCases[] = {
+    {"OneFile", 25, 512, 0, 10, 0},
+    {"ShortBlocks", 25, 441, 0, 10, 2000},
+    {"AacBlocks", 25, 1024, 0, 10, 2000},
+    {"BlocksLongerThanPictures", 25, 4410, 0, 10, 2000},
+    {"BlocksOfHalfASecond", 25, 22050, 0, 10, 2000},
+    {"SixtyPicturesASecond", 60, 1024, 0, 10, 2000},
+    {"SoundLate", 25, 1024, 100 * kMillisecond, 9.9, 2000},
+    {"SoundEarly", 25, 1024, -100 * kMillisecond, 10.1, 2000},
+    {"SoundEndsEarly", 25, 1024, 0, 3.3, 2000},
+    {"SoundVeryLate", 25, 1024, 5 * kSecond, 5, 2000},
+    {"SoundVeryLateInOneFile", 25, 1024, 5 * kSecond, 5, 0},
+    {"SoundVeryEarly", 25, 1024, -3 * kSecond, 13, 2000},
+    {"ClipAPicture", 25, 256, 0, 10, 1},
+};
+
+INSTANTIATE_TEST_SUITE_P(StampNormaliser, KnownCases, testing::ValuesIn(kCases),
+                         [](const auto& info) { return std::string(info.param.name); });
+
+TEST(StampNormaliser, KeepsPicturesAndSoundTogetherForRandomSources) {
+    std::mt19937 random(20);
+    const auto pick = [&](int from, int to) { return std::uniform_int_distribution<int>(from, to)(random); };
+    constexpr double kRates[] = {10, 12.5, 15, 23.976, 24, 25, 29.97, 30, 50, 59.94, 60, 120};
+    constexpr int kSampleRates[] = {8000, 11025, 22050, 44100, 48000, 96000};
+    for (int round = 0; round < 400; ++round) {
+        ModelSource source;
+        source.fps = kRates[pick(0, std::size(kRates) - 1)];
+        source.sampleRate = kSampleRates[pick(0, std::size(kSampleRates) - 1)];
+        source.pictures = pick(1, 400);
+        source.blockSamples = pick(source.sampleRate / 1000, source.sampleRate / 2);
+        source.soundOffset = pick(-3000, 3000) * kMillisecond;
+        source.soundSeconds = pick(0, 20'000) / 1000.0;
+        source.stampRounding = pick(0, 2) == 0 ? kMillisecond : 1;
+        source.splitMilliseconds = pick(0, 3) == 0 ? 0 : pick(100, 8000);
+        CheckAllClips(source, "round " + std::to_string(round));
+        if (testing::Test::HasFailure())
+            return;
+    }
+}
+
+TEST(StampNormaliser, KeepsTheStepsOfAVariableRate) {
+    std::mt19937 random(21);
+    std::uniform_int_distribution<int64_t> step(5 * kMillisecond, 75 * kMillisecond);
+    ModelSource source;
+    for (int64_t time = 0; time < 8 * kSecond; time += step(random))
+        source.pictureTimes.push_back(time);
+    source.blockSamples = 256;
+    source.soundSeconds = 8;
+    const Placed placed = Place(RunEngineModel(source).front(), source);
+    for (size_t i = 0; i < placed.times.size(); ++i)
+        ASSERT_NEAR(placed.times[i], placed.sources[i], 2) << i;
+}
+
+TEST(StampNormaliser, DoesNotDriftInHours) {
+    ModelSource source;
+    source.fps = 29.97;
+    source.pictures = static_cast<int>(29.97 * 3 * 3600);
+    source.soundSeconds = 3 * 3600;
+    source.blockSamples = 1024;
+    const Placed placed = Place(RunEngineModel(source).front(), source);
+    EXPECT_NEAR(placed.times.back() - placed.soundStart, placed.sources.back(), 10);
+}
+
+TEST(StampNormaliser, CatchesUpAfterAHoleInTheSoundWithoutEverGoingBack) {
+    StampNormaliser stamps(400'000, true);
+    const int64_t bytes_per_second = 44100 * 4;
+    int64_t last = -1;
+    // 40 ms of sound before every picture; after a second the source's sound skips two seconds, so that the
+    // pictures step back by as much until they have reached the sound again.
+    for (int picture = 0; picture < 400; ++picture) {
+        const bool waiting = picture >= 25 && picture < 75;
+        const int64_t position = (picture < 25 ? picture : picture < 75 ? 25 : picture - 50) * 400'000;
+        if (!waiting)
+            stamps.AddSound(position, bytes_per_second / 25, bytes_per_second, false);
+        const int64_t time = stamps.AddPicture(waiting ? position - (75 - picture) * 400'000 : position);
+        ASSERT_GT(time, last) << picture;
+        ASSERT_LE(time - last, 400'001) << picture;
+        last = time;
+    }
+    EXPECT_NEAR(last, (400 - 1 - 50) * 400'000, 400'000);
+    EXPECT_GT(stamps.Repairs(), 0);
+}
+
+TEST(StampNormaliser, PicturesWithoutStampsKeepTheUsualDistance) {
+    StampNormaliser stamps(400'000, true);
+    for (int picture = 0; picture < 10; ++picture)
+        EXPECT_EQ(stamps.AddPicture(-1), picture * 400'000);
+}
+
+TEST(StampNormaliser, PicturesAloneBeginAtZeroWhereverTheirStampsBegin) {
+    for (const int64_t base : {int64_t{0}, 50 * kSecond, -7 * kSecond, INT64_C(1) << 60}) {
+        StampNormaliser stamps(400'000, true);
+        for (int picture = 0; picture < 10; ++picture)
+            EXPECT_EQ(stamps.AddPicture(base + picture * 500'000), picture * 500'000);
+    }
+}
+
+TEST(StampNormaliser, SoundAloneBeginsAtZero) {
+    EXPECT_EQ(StampNormaliser(400'000, false).SoundStart(), 0);
+    StampNormaliser waiting(400'000, true);
+    waiting.AddSound(0, 1000, 176'400, false);
+    EXPECT_FALSE(waiting.SoundStart().has_value());
+    waiting.AddSound(0, 176'400, 176'400, false);
+    EXPECT_EQ(waiting.SoundStart(), 0);
+}
+
+TEST(StampNormaliser, CountsSoundOfChangingByteRates) {
+    StampNormaliser stamps(400'000, true);
+    stamps.AddSound(0, 176'400, 176'400, false);
+    stamps.AddSound(0, 96'000, 192'000, true);
+    stamps.AddSound(0, 176'400 * 2, 176'400, false);
+    EXPECT_EQ(stamps.SoundLength(), 35'000'000);
+}
+
+} // namespace
