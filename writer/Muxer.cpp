@@ -6,6 +6,7 @@
 #include <algorithm>
 #include <new>
 #include <string>
+#include <utility>
 
 namespace writer {
 namespace {
@@ -103,6 +104,8 @@ void Muxer::Write(AVPacket& packet, int stream) {
 
 void Muxer::WriteTrailer() {
     const std::lock_guard lock(mutex_);
+    if (std::exchange(ended_, true))
+        return;
     Check(av_write_trailer(output_.get()), "cannot be finished");
 }
 

@@ -37,6 +37,7 @@ public:
     /// Takes the packet's content. Times are in the stream's unit; those of decoding must not fall.
     void Write(AVPacket& packet, int stream);
 
+    /// The end of the file; a second call does nothing.
     void WriteTrailer();
 
     /// What a reader of the file, and a second muxer for the same packets, need to know of a stream.
@@ -69,6 +70,7 @@ private:
     av::Packet packet_;
     mutable std::mutex mutex_; ///< Guards everything once the header is written.
     std::vector<State> streams_;
+    bool ended_ = false;
 };
 
 } // namespace writer

@@ -1,0 +1,236 @@
+// The five functions with arguments that make no sense, and what the status header says of a file.
+#include "MovieReader.h"
+#include "TestSource.h"
+#include "text/Utf8.h"
+#include "writer/WriterStatus.h"
+
+#include <gtest/gtest.h>
+
+#include <cerrno>
+#include <filesystem>
+#include <fstream>
+#include <functional>
+#include <iterator>
+#include <string>
+#include <vector>
+
+namespace {
+
+WriterStatus Latest() {
+    WriterStatus status{};
+    EXPECT_EQ(MWGetFileStatus(MWGetFileCount(), &status), 1);
+    return status;
+}
+
+TEST(MediaWriter, TakesNullHandlesAndRecords) {
+    const VideoImage image{};
+    const AudioFrame frame{};
+    EXPECT_EQ(MWWriteVideoFrame(nullptr, &image), 0);
+    EXPECT_EQ(MWWriteAudioData(nullptr, &frame), 0);
+    EXPECT_EQ(MWCloseMediaFile(nullptr, nullptr, nullptr), 0);
+    const TemporaryFolder folder;
+    void* file = TestMovie().Create(folder.Path("movie"));
+    ASSERT_NE(file, nullptr);
+    EXPECT_EQ(MWWriteVideoFrame(file, nullptr), 0);
+    EXPECT_EQ(MWWriteAudioData(file, nullptr), 0);
+    EXPECT_EQ(MWCloseMediaFile(file, nullptr, nullptr), 1);
+}
+
+TEST(MediaWriter, RefusesRecordsThatMakeNoSense) {
+    const TemporaryFolder folder;
+    void* file = TestMovie().Create(folder.Path("movie"));
+    ASSERT_NE(file, nullptr);
+    TestPicture picture(160, 120);
+    const VideoImage good_image = picture.Paint(0, 0);
+    const std::vector<std::function<void(VideoImage&)>> image_faults{
+        [](VideoImage& image) { image.nFormat = 1; },       [](VideoImage& image) { image.pU = nullptr; },
+        [](VideoImage& image) { image.nWidth = 0; },        [](VideoImage& image) { image.nHeight = -120; },
+        [](VideoImage& image) { image.nPitchY = 159; },     [](VideoImage& image) { image.nPitchV = 79; },
+        [](VideoImage& image) { image.nWidth = INT32_MAX; }};
+    for (const auto& spoil : image_faults) {
+        VideoImage image = good_image;
+        spoil(image);
+        EXPECT_EQ(MWWriteVideoFrame(file, &image), 0);
+    }
+    TestSound sound(44100, 2, 16);
+    const AudioFrame good_frame = sound.Next(100, 0);
+    const std::vector<std::function<void(AudioFrame&)>> frame_faults{[](AudioFrame& frame) { frame.nSampleRate = 0; },
+                                                                     [](AudioFrame& frame) { frame.nChannels = 0; },
+                                                                     [](AudioFrame& frame) { frame.nBitsPerSample = 12; },
+                                                                     [](AudioFrame& frame) { frame.pData = nullptr; },
+                                                                     [](AudioFrame& frame) { frame.nLength = 0; },
+                                                                     [](AudioFrame& frame) { frame.nLength = -4; }};
+    for (const auto& spoil : frame_faults) {
+        AudioFrame frame = good_frame;
+        spoil(frame);
+        EXPECT_EQ(MWWriteAudioData(file, &frame), 0);
+    }
+    EXPECT_EQ(MWWriteVideoFrame(file, &good_image), 1);
+    EXPECT_EQ(MWWriteAudioData(file, &good_frame), 1);
+    EXPECT_EQ(MWCloseMediaFile(file, nullptr, nullptr), 1);
+    EXPECT_EQ(Latest().llPicturesReceived, 1);
+    EXPECT_EQ(Latest().llSamplesReceived, 100);
+}
+
+struct Refusal {
+    const char* name;
+    void (*spoil)(TestMovie&);
+    int error;
+};
+
+class Refusals : public testing::TestWithParam<Refusal> {};
+
+TEST_P(Refusals, GiveNullAndTheReason) {
+    const TemporaryFolder folder;
+    TestMovie movie;
+    GetParam().spoil(movie);
+    EXPECT_EQ(movie.Create(folder.Path("movie")), nullptr);
+    WriterStatus status{};
+    ASSERT_EQ(MWGetLastFailure(&status), 1);
+    EXPECT_EQ(status.nError, GetParam().error);
+    EXPECT_EQ(status.nState, kWriterFileFailed);
+    EXPECT_EQ(status.szPath, folder.Path("movie"));
+    EXPECT_NE(std::string(status.szWhat), "");
+    EXPECT_TRUE(folder.Names().empty());
+}
+
+constexpr Refusal kRefusals[] = {
+    {"UnknownFormat", [](TestMovie& movie) { movie.param.fccFileFormat = FourCC("XXXX"); },
+     kWriterErrorFormat},
+    {"NoFormat", [](TestMovie& movie) { movie.param.fccFileFormat = 0; }, kWriterErrorFormat},
+    {"Copy", [](TestMovie& movie) { movie.param.fccFileFormat = FourCC("COPY"); }, kWriterErrorFormat},
+    {"UnknownVideo", [](TestMovie& movie) { movie.param.fccVideo = FourCC("ABCD"); }, kWriterErrorCodec},
+    {"NoVideoCodec", [](TestMovie& movie) { movie.param.fccVideo = 0; }, kWriterErrorCodec},
+    {"VideoThatDoesNotFit", [](TestMovie& movie) { movie.param.fccVideo = FourCC("VP80"); },
+     kWriterErrorCodec},
+    {"SoundThatDoesNotFit", [](TestMovie& movie) { movie.param.fccAudio = FourCC("PCM "); },
+     kWriterErrorCodec},
+    {"NegativeSize", [](TestMovie& movie) { movie.param.nWidth = -160; }, kWriterErrorArgument},
+    {"NoSize", [](TestMovie& movie) { movie.width = 0; }, kWriterErrorArgument},
+    {"NoStream", [](TestMovie& movie) { movie.hasVideo = movie.hasAudio = false; }, kWriterErrorArgument},
+    {"BothLeftOut", [](TestMovie& movie) { movie.param.bNoVideo = movie.param.bNoAudio = 1; },
+     kWriterErrorArgument},
+    {"NoRate", [](TestMovie& movie) { movie.sampleRate = 0; }, kWriterErrorArgument},
+};
+
+INSTANTIATE_TEST_SUITE_P(MediaWriter, Refusals, testing::ValuesIn(kRefusals),
+                         [](const auto& info) { return std::string(info.param.name); });
+
+TEST(MediaWriter, RefusesTargetsThatAreNotFiles) {
+    const TemporaryFolder folder;
+    EXPECT_EQ(MWCreateMediaFile(nullptr, nullptr, nullptr, nullptr), nullptr);
+    EXPECT_EQ(Latest().nError, kWriterErrorArgument);
+    EXPECT_EQ(TestMovie().Create(folder.Path()), nullptr);
+    EXPECT_EQ(Latest().nSystemError, EISDIR);
+    EXPECT_EQ(TestMovie().Create("/dev/null"), nullptr);
+    EXPECT_EQ(Latest().nError, kWriterErrorOpen);
+    EXPECT_EQ(TestMovie().Create(folder.Path("missing/movie")), nullptr);
+    EXPECT_EQ(Latest().nSystemError, ENOENT);
+}
+
+TEST(MediaWriter, KeepsAnExistingFileWhenAsked) {
+    const TemporaryFolder folder;
+    const std::string path = folder.Path("movie");
+    std::ofstream(path) << "precious";
+    WriterOptions options{};
+    options.bKeepExisting = 1;
+    MWSetWriterOptions(&options);
+    EXPECT_EQ(TestMovie().Create(path), nullptr);
+    EXPECT_EQ(Latest().nError, kWriterErrorExists);
+    // One that appears in the meantime is kept as well.
+    std::filesystem::remove(path);
+    void* file = TestMovie().Create(path);
+    TestMovie().WriteAll(file);
+    std::ofstream(path) << "precious";
+    EXPECT_EQ(MWCloseMediaFile(file, nullptr, nullptr), 0);
+    EXPECT_EQ(Latest().nSystemError, EEXIST);
+    EXPECT_EQ(std::filesystem::file_size(path), 8U);
+    EXPECT_EQ(ReadMovieFile(Latest().szTemporaryPath).pictures.size(), 50U);
+    MWSetWriterOptions(nullptr);
+    EXPECT_TRUE(TestMovie().Write(path));
+    EXPECT_EQ(ReadMovieFile(path).pictures.size(), 50U);
+}
+
+TEST(MediaWriter, WritesThroughALinkAndLeavesIt) {
+    const TemporaryFolder folder;
+    std::ofstream(folder.Path("real")) << "old";
+    std::filesystem::create_symlink("real", folder.Path("link"));
+    EXPECT_TRUE(TestMovie().Write(folder.Path("link")));
+    EXPECT_TRUE(std::filesystem::is_symlink(folder.Path("link")));
+    EXPECT_EQ(ReadMovieFile(folder.Path("real")).pictures.size(), 50U);
+}
+
+TEST(MediaWriter, TakesAnyName) {
+    const TemporaryFolder folder;
+    std::string longest(255, 'x');
+    for (const std::string& name :
+         {std::string("file:http:movie"), std::string("100% \"quoted\" 'name'"), std::string("-dash..mp4"),
+          std::string("\xD0\xA4\xD0\xB8\xD0\xBB\xD1\x8C\xD0\xBC"), std::string("latin-\xE9.mp4"), longest,
+          longest.replace(3, 2, "\xC3\xA9")}) {
+        EXPECT_TRUE(TestMovie().Write(folder.Path(name))) << name;
+        EXPECT_EQ(folder.Names(), std::vector<std::string>{name});
+        EXPECT_EQ(Latest().szPath, folder.Path(name));
+        std::filesystem::remove(folder.Path(name));
+    }
+}
+
+TEST(MediaWriter, DoesNotTouchTheRemainsOfAnEarlierRun) {
+    const TemporaryFolder folder;
+    std::ofstream(folder.Path("movie.part")) << "remains";
+    EXPECT_TRUE(TestMovie().Write(folder.Path("movie")));
+    EXPECT_EQ(folder.Names(), (std::vector<std::string>{"movie", "movie.part"}));
+    EXPECT_EQ(std::filesystem::file_size(folder.Path("movie.part")), 7U);
+}
+
+TEST(MediaWriter, TellsAListenerOfAFilesLife) {
+    struct Heard {
+        std::vector<int> events;
+        std::vector<double> finished;
+        WriterStatus last;
+    } heard{};
+    WriterOptions options{};
+    options.pContext = &heard;
+    options.pfnListener = [](void* context, int event, const WriterStatus* status) {
+        auto* self = static_cast<Heard*>(context);
+        if (self->events.empty() || self->events.back() != event)
+            self->events.push_back(event);
+        if (event == kWriterEventFinishing)
+            self->finished.push_back(status->dFinished);
+        self->last = *status;
+    };
+    MWSetWriterOptions(&options);
+    const TemporaryFolder folder;
+    EXPECT_TRUE(TestMovie().Write(folder.Path("movie")));
+    EXPECT_EQ(heard.events,
+              (std::vector<int>{kWriterEventOpened, kWriterEventFinishing, kWriterEventClosed}));
+    EXPECT_TRUE(std::is_sorted(heard.finished.begin(), heard.finished.end()));
+    EXPECT_GT(heard.finished.size(), 3U);
+    EXPECT_EQ(heard.last.nState, kWriterFileComplete);
+    EXPECT_EQ(heard.last.llBytesWritten,
+              static_cast<int64_t>(std::filesystem::file_size(folder.Path("movie"))));
+    EXPECT_EQ(std::string(heard.last.szTemporaryPath), "");
+    EXPECT_EQ(heard.last.llPicturesReceived, 50);
+    EXPECT_DOUBLE_EQ(heard.last.dVideoReceived, 2.0);
+    EXPECT_NEAR(heard.last.dAudioReceived, 2.0, 1e-6);
+    EXPECT_DOUBLE_EQ(heard.last.dFinished, 1.0);
+    MWSetWriterOptions(nullptr);
+}
+
+TEST(MediaWriter, RemembersTheLatestFilesOnly) {
+    WriterStatus status{};
+    EXPECT_EQ(MWGetFileStatus(0, &status), 0);
+    EXPECT_EQ(MWGetFileStatus(MWGetFileCount() + 1, &status), 0);
+    const TemporaryFolder folder;
+    void* open = TestMovie().Create(folder.Path("open"));
+    const int number = MWGetFileCount();
+    for (int i = 0; i < 80; ++i)
+        MWCreateMediaFile(L"", nullptr, nullptr, nullptr);
+    EXPECT_EQ(MWGetFileStatus(number, &status), 1) << "an open file is forgotten";
+    EXPECT_EQ(status.nState, kWriterFileWriting);
+    EXPECT_EQ(MWGetFileStatus(number + 1, &status), 0);
+    EXPECT_EQ(MWGetFileStatus(number + 80, &status), 1);
+    EXPECT_EQ(MWGetFileStatus(number, nullptr), 0);
+    MWCloseMediaFile(open, nullptr, nullptr);
+}
+
+} // namespace
