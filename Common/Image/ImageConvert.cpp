@@ -16,22 +16,23 @@ using namespace image;
 enum class RowOrder { kTopDown, kBottomUp };
 
 /// A picture without rows when its size is zero or less.
-Picture MakePicture(uint8_t* bits, int64_t width, int64_t height, int64_t pitch, RowOrder order) {
+Picture MakePicture(uint8_t* bits, int64_t width, int64_t height, int64_t pitch, ptrdiff_t pixelBytes,
+                    RowOrder order) {
     if (width <= 0 || height <= 0)
         return {};
     const auto rows = static_cast<ptrdiff_t>(height);
     const auto step = static_cast<ptrdiff_t>(pitch);
     return {order == RowOrder::kBottomUp ? BottomUp(bits, step, rows) : Rows{bits, step},
-            static_cast<ptrdiff_t>(width), rows};
+            static_cast<ptrdiff_t>(width), rows, pixelBytes};
 }
 
 Picture Bitmap32(const tagBITMAPINFOHEADER* header, uint8_t* bits, RowOrder order) {
-    return MakePicture(bits, header->biWidth, header->biHeight, int64_t{4} * header->biWidth, order);
+    return MakePicture(bits, header->biWidth, header->biHeight, int64_t{4} * header->biWidth, 4, order);
 }
 
 Picture Bitmap24(const tagBITMAPINFOHEADER* header, uint8_t* bits) {
     const int64_t pitch = (int64_t{3} * header->biWidth + 3) & ~int64_t{3};
-    return MakePicture(bits, header->biWidth, header->biHeight, pitch, RowOrder::kBottomUp);
+    return MakePicture(bits, header->biWidth, header->biHeight, pitch, 3, RowOrder::kBottomUp);
 }
 
 Planes420 MakePlanes(uint8_t* y, uint8_t* u, uint8_t* v, int pitchY, int pitchU, int pitchV) {
@@ -49,35 +50,63 @@ ptrdiff_t EvenAbove(ptrdiff_t x) {
     return EvenBelow(x + 1);
 }
 
-void Convert(To420 kernel, const Planes420& target, const Picture& source) {
+/// The kernels for packed rows or one plane. From about 8 MB on nothing of them stays in a cache until it is
+/// used.
+const RowKernels& KernelsFor(Rows target, ptrdiff_t width, int64_t bytes) {
+    constexpr int64_t kLargeBytes = int64_t{8} << 20;
+    const RowKernels& kernels = BestRowKernels();
+    const bool large = bytes >= kLargeBytes && kernels.large != nullptr && width % kLargeWidthStep == 0 &&
+                       target.AlignedTo(kLargeAlignment);
+    return large ? *kernels.large : kernels;
+}
+
+const RowKernels& KernelsFor(const Picture& target) {
+    return KernelsFor(target.rows, target.width, target.Pixels() * target.pixelBytes);
+}
+
+void Convert(To420 RowKernels::*kernel, const Planes420& target, const Picture& source) {
+    const To420 convert = BestRowKernels().*kernel;
     ForRowPairs(source.height, [&](ptrdiff_t row0, ptrdiff_t row1, ptrdiff_t chroma) {
-        kernel(target.y.Targets(row0, row1), target.u[chroma], target.v[chroma],
-               source.rows.Sources(row0, row1), source.width);
+        convert(target.y.Targets(row0, row1), target.u[chroma], target.v[chroma],
+                source.rows.Sources(row0, row1), source.width);
     });
 }
 
-void Convert(To420Alpha kernel, const Planes420& target, Rows alpha, const Picture& source) {
+void Convert(To420Alpha RowKernels::*kernel, const Planes420& target, Rows alpha, const Picture& source) {
+    const To420Alpha convert = BestRowKernels().*kernel;
     ForRowPairs(source.height, [&](ptrdiff_t row0, ptrdiff_t row1, ptrdiff_t chroma) {
-        kernel(target.y.Targets(row0, row1), target.u[chroma], target.v[chroma], alpha.Targets(row0, row1),
-               source.rows.Sources(row0, row1), source.width);
+        convert(target.y.Targets(row0, row1), target.u[chroma], target.v[chroma], alpha.Targets(row0, row1),
+                source.rows.Sources(row0, row1), source.width);
     });
 }
 
-void Convert(From420 kernel, const Picture& target, const Planes420& source) {
+void ConvertPairs(From420 convert, const Picture& target, const Planes420& source) {
     ForRowPairs(target.height, [&](ptrdiff_t row0, ptrdiff_t row1, ptrdiff_t chroma) {
-        kernel(target.rows.Targets(row0, row1), source.y.Sources(row0, row1), source.u[chroma],
-               source.v[chroma], target.width);
+        convert(target.rows.Targets(row0, row1), source.y.Sources(row0, row1), source.u[chroma],
+                source.v[chroma], target.width);
     });
 }
 
-void Convert(RowToRow kernel, Rows target, Rows source, ptrdiff_t width, ptrdiff_t height) {
-    for (ptrdiff_t row = 0; row < height; ++row)
-        kernel(target[row], source[row], width);
+void Convert(From420 RowKernels::*kernel, const Picture& target, const Planes420& source) {
+    ConvertPairs(KernelsFor(target).*kernel, target, source);
 }
 
-void Convert(DoubleRow kernel, Rows target, Rows source, ptrdiff_t width, ptrdiff_t height) {
-    for (ptrdiff_t row = 0; row < height; ++row)
-        kernel(target.Targets(2 * row, 2 * row + 1), source[row], width);
+void Convert(From420 (RowKernels::*kernels)[kPackedOrders], PackedOrder order, const Picture& target,
+             const Planes420& source) {
+    ConvertPairs((KernelsFor(target).*kernels)[order], target, source);
+}
+
+void Convert(RowToRow (RowKernels::*kernels)[kPackedOrders], PackedOrder order, const Picture& target,
+             Rows source) {
+    const RowToRow convert = (KernelsFor(target).*kernels)[order];
+    for (ptrdiff_t row = 0; row < target.height; ++row)
+        convert(target.rows[row], source[row], target.width);
+}
+
+void Double(const Picture& source, Rows target) {
+    const DoubleRow convert = KernelsFor(target, source.width, 4 * source.Pixels()).doubled;
+    for (ptrdiff_t row = 0; row < source.height; ++row)
+        convert(target.Targets(2 * row, 2 * row + 1), source.rows[row], source.width);
 }
 
 void Copy(Rows target, Rows source, ptrdiff_t bytes, ptrdiff_t height) {
@@ -92,7 +121,7 @@ void Rgb32_2_yuv420(unsigned char* pY, unsigned char* pU, unsigned char* pV, int
                     tagBITMAPINFOHEADER* lpSrcBmi, unsigned char* lpSrcBits) {
     CHECK_AT(652, lpSrcBmi && lpSrcBmi->biBitCount == 32);
     CHECK_AT(653, lpSrcBits && pY && pU && pV);
-    Convert(BestRowKernels().bgr32To420, MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V),
+    Convert(&RowKernels::bgr32To420, MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V),
             Bitmap32(lpSrcBmi, lpSrcBits, RowOrder::kBottomUp));
 }
 
@@ -100,7 +129,7 @@ void Argb_2_yuv420(unsigned char* pY, unsigned char* pU, unsigned char* pV, int 
                    tagBITMAPINFOHEADER* lpSrcBmi, unsigned char* lpSrcBits) {
     CHECK_AT(887, lpSrcBmi && lpSrcBmi->biBitCount == 32);
     CHECK_AT(888, lpSrcBits && pY && pU && pV);
-    Convert(BestRowKernels().bgr32To420, MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V),
+    Convert(&RowKernels::bgr32To420, MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V),
             Bitmap32(lpSrcBmi, lpSrcBits, RowOrder::kTopDown));
 }
 
@@ -109,22 +138,22 @@ void Rgb32_2_yuv420_Ex(unsigned char* pY, unsigned char* pU, unsigned char* pV, 
     CHECK_AT(761, lpSrcBits && pY && pU && pV);
     const int64_t height = nHeightSrc;
     const Picture source = height < 0
-                               ? MakePicture(lpSrcBits, nWidthSrc, -height, nPitchSrc, RowOrder::kBottomUp)
-                               : MakePicture(lpSrcBits, nWidthSrc, height, nPitchSrc, RowOrder::kTopDown);
-    Convert(BestRowKernels().bgr32To420, MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V), source);
+                               ? MakePicture(lpSrcBits, nWidthSrc, -height, nPitchSrc, 4, RowOrder::kBottomUp)
+                               : MakePicture(lpSrcBits, nWidthSrc, height, nPitchSrc, 4, RowOrder::kTopDown);
+    Convert(&RowKernels::bgr32To420, MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V), source);
 }
 
 void Rgb24_2_yuv420(unsigned char* pY, unsigned char* pU, unsigned char* pV, int nPt_Y, int nPt_U, int nPt_V,
                     tagBITMAPINFOHEADER* lpSrcBmi, unsigned char* lpSrcBits) {
     CHECK_AT(996, lpSrcBmi && lpSrcBmi->biBitCount == 24);
     CHECK_AT(997, lpSrcBits && pY && pU && pV);
-    Convert(BestRowKernels().bgr24To420, MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V),
+    Convert(&RowKernels::bgr24To420, MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V),
             Bitmap24(lpSrcBmi, lpSrcBits));
 }
 
 void Rgb24_2_yuv420Simple(unsigned char* pY, unsigned char* pU, unsigned char* pV, int nPt_Y, int nPt_U,
                           int nPt_V, tagBITMAPINFOHEADER* lpSrcBmi, unsigned char* lpSrcBits) {
-    Convert(BestRowKernels().bgr24To420Simple, MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V),
+    Convert(&RowKernels::bgr24To420Simple, MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V),
             Bitmap24(lpSrcBmi, lpSrcBits).WholeBlocks());
 }
 
@@ -144,7 +173,7 @@ void Rgb32_2_yuv420A(unsigned char* pY, unsigned char* pU, unsigned char* pV, un
         Rgb32_2_yuv420A_R(pY, pU, pV, pA, nPt_Y, nPt_U, nPt_V, lpSrcBmi, lpSrcBits);
         return;
     }
-    Convert(BestRowKernels().bgra32To420, MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V), Rows{pA, nPt_Y},
+    Convert(&RowKernels::bgra32To420, MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V), Rows{pA, nPt_Y},
             Bitmap32(lpSrcBmi, lpSrcBits, RowOrder::kTopDown));
 }
 
@@ -152,7 +181,7 @@ void Rgb32_2_yuv420A_R(unsigned char* pY, unsigned char* pU, unsigned char* pV, 
                        int nPt_U, int nPt_V, tagBITMAPINFOHEADER* lpSrcBmi, unsigned char* lpSrcBits) {
     CHECK_AT(1683, lpSrcBmi && lpSrcBmi->biBitCount == 32);
     CHECK_AT(1684, lpSrcBits && pY && pU && pV);
-    Convert(BestRowKernels().bgra32To420, MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V), Rows{pA, nPt_Y},
+    Convert(&RowKernels::bgra32To420, MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V), Rows{pA, nPt_Y},
             Bitmap32(lpSrcBmi, lpSrcBits, RowOrder::kBottomUp));
 }
 
@@ -160,7 +189,7 @@ void Yuv420_2_rgb24(tagBITMAPINFOHEADER* lpDstBmi, unsigned char* lpDstBits, uns
                     unsigned char* pU, unsigned char* pV, int nPt_Y, int nPt_U, int nPt_V) {
     CHECK_AT(283, lpDstBmi && lpDstBmi->biBitCount == 24);
     CHECK_AT(284, lpDstBits && pY && pU && pV);
-    Convert(BestRowKernels().bgr24From420, Bitmap24(lpDstBmi, lpDstBits),
+    Convert(&RowKernels::bgr24From420, Bitmap24(lpDstBmi, lpDstBits),
             MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V));
 }
 
@@ -168,7 +197,7 @@ void Yuv420_2_rgb32(tagBITMAPINFOHEADER* lpDstBmi, unsigned char* lpDstBits, uns
                     unsigned char* pU, unsigned char* pV, int nPt_Y, int nPt_U, int nPt_V) {
     CHECK_AT(414, lpDstBmi && lpDstBmi->biBitCount == 32);
     CHECK_AT(415, lpDstBits && pY && pU && pV);
-    Convert(BestRowKernels().bgrxFrom420, Bitmap32(lpDstBmi, lpDstBits, RowOrder::kBottomUp),
+    Convert(&RowKernels::bgrxFrom420, Bitmap32(lpDstBmi, lpDstBits, RowOrder::kBottomUp),
             MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V));
 }
 
@@ -176,13 +205,13 @@ void Yuv420_2_Argb(tagBITMAPINFOHEADER* lpDstBmi, unsigned char* lpDstBits, unsi
                    unsigned char* pU, unsigned char* pV, int nPt_Y, int nPt_U, int nPt_V) {
     CHECK_AT(529, lpDstBmi && lpDstBmi->biBitCount == 32);
     CHECK_AT(530, lpDstBits && pY && pU && pV);
-    Convert(BestRowKernels().bgraFrom420, Bitmap32(lpDstBmi, lpDstBits, RowOrder::kTopDown),
+    Convert(&RowKernels::bgraFrom420, Bitmap32(lpDstBmi, lpDstBits, RowOrder::kTopDown),
             MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V));
 }
 
 void Yuv420_2_rgb24Simple(tagBITMAPINFOHEADER* lpDstBmi, unsigned char* lpDstBits, unsigned char* pY,
                           unsigned char* pU, unsigned char* pV, int nPt_Y, int nPt_U, int nPt_V) {
-    Convert(BestRowKernels().bgr24From420Simple, Bitmap24(lpDstBmi, lpDstBits).WholeBlocks(),
+    Convert(&RowKernels::bgr24From420Simple, Bitmap24(lpDstBmi, lpDstBits).WholeBlocks(),
             MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V));
 }
 
@@ -216,9 +245,9 @@ void Rgb24_2_YUY2(unsigned char* lpBitsDst, int nPitchDst, int xDst, int yDst, i
     if (cxDst <= 0 || cyDst <= 0)
         return;
     const ptrdiff_t start = EvenBelow(xDst);
-    Convert(BestRowKernels().packedFromBgr24[OrderOf(bYUY2)], Rows{lpBitsDst, nPitchDst}.At(yDst, 2 * start),
-            BottomUp(lpBitsSrc, nPitchSrc, nHeightSrc).At(ySrc, ptrdiff_t{3} * xSrc), cxDst + (xDst - start),
-            cyDst);
+    const Picture target{Rows{lpBitsDst, nPitchDst}.At(yDst, 2 * start), cxDst + (xDst - start), cyDst, 2};
+    Convert(&RowKernels::packedFromBgr24, OrderOf(bYUY2), target,
+            BottomUp(lpBitsSrc, nPitchSrc, nHeightSrc).At(ySrc, ptrdiff_t{3} * xSrc));
 }
 
 void YUY2_2_Rgb24(unsigned char* lpBitsDst, int nHeightDst, int nPitchDst, int xDst, int yDst, int cx, int cy,
@@ -226,9 +255,9 @@ void YUY2_2_Rgb24(unsigned char* lpBitsDst, int nHeightDst, int nPitchDst, int x
     CHECK_AT(1232, lpBitsDst && lpBitsSrc);
     if (cx <= 0 || cy <= 0)
         return;
-    Convert(BestRowKernels().bgr24FromPacked[OrderOf(bYUY2)],
-            BottomUp(lpBitsDst, nPitchDst, nHeightDst).At(yDst, ptrdiff_t{3} * xDst),
-            Rows{lpBitsSrc, nPitchSrc}.At(ySrc, 2 * EvenBelow(xSrc)), cx, cy);
+    const Picture target{BottomUp(lpBitsDst, nPitchDst, nHeightDst).At(yDst, ptrdiff_t{3} * xDst), cx, cy, 3};
+    Convert(&RowKernels::bgr24FromPacked, OrderOf(bYUY2), target,
+            Rows{lpBitsSrc, nPitchSrc}.At(ySrc, 2 * EvenBelow(xSrc)));
 }
 
 void YUY2_2_Yuv420(unsigned char* pY, unsigned char* pU, unsigned char* pV, int nPt_Y, int nPt_U, int nPt_V,
@@ -236,8 +265,8 @@ void YUY2_2_Yuv420(unsigned char* pY, unsigned char* pU, unsigned char* pV, int 
                    unsigned int bYUY2, int xSrc, int ySrc) {
     if (cx <= 0 || cy <= 0)
         return;
-    const To420 kernel = BestRowKernels().packedTo420[OrderOf(bYUY2)];
     const Planes420 target = MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V).At(xDst, yDst);
+    const To420 kernel = BestRowKernels().packedTo420[OrderOf(bYUY2)];
     const Rows source = Rows{lpBitsSrc, nPitchSrc}.At(ySrc, 2 * EvenBelow(xSrc));
     const int64_t lastAllowed = (int64_t{ySrc} + cy) * nPt_V;
     ForRowPairs(EvenAbove(cy), [&](ptrdiff_t row0, ptrdiff_t row1, ptrdiff_t chroma) {
@@ -257,8 +286,9 @@ void Yuv420_2_YUY2(unsigned char* lpBitsDst, int nPitchDst, int xDst, int yDst, 
                    int nPt_U, int nPt_V, int xSrc, int ySrc) {
     if (cx <= 0 || cy <= 0)
         return;
-    const Rows target = Rows{lpBitsDst, nPitchDst}.At(yDst, 2 * EvenBelow(xDst));
-    Convert(BestRowKernels().packedFrom420[OrderOf(bYUY2)], Picture{target, EvenAbove(cx), EvenAbove(cy)},
+    const Picture target{Rows{lpBitsDst, nPitchDst}.At(yDst, 2 * EvenBelow(xDst)), EvenAbove(cx),
+                         EvenAbove(cy), 2};
+    Convert(&RowKernels::packedFrom420, OrderOf(bYUY2), target,
             MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V).At(xSrc, ySrc));
 }
 
@@ -290,7 +320,7 @@ void YUY2_Blt_fast(unsigned char* lpBitsDst, int nPitchDst, int xDst, int yDst, 
         Copy(target, source, ptrdiff_t{2} * cx, cy);
         return;
     }
-    const RowToRow swap = BestRowKernels().swapPacked;
+    const RowToRow swap = KernelsFor({target, cx, cy, 2}).swapPacked;
     ForRows(target, source, 2 * EvenAbove(cx), cy,
             [swap](uint8_t* to, const uint8_t* from, ptrdiff_t bytes) { swap(to, from, bytes / 2); });
 }
@@ -298,8 +328,8 @@ void YUY2_Blt_fast(unsigned char* lpBitsDst, int nPitchDst, int xDst, int yDst, 
 void YUV444_2_420(unsigned char* pDst, unsigned char* pSrc, int cx, int cy) {
     if (cx <= 0 || cy <= 0)
         return;
-    const HalveRows halve = BestRowKernels().halve;
     const Rows target{pDst, EvenAbove(cx) / 2};
+    const HalveRows halve = BestRowKernels().halve;
     const Rows source{pSrc, cx};
     ForRowPairs(cy, [&](ptrdiff_t row0, ptrdiff_t row1, ptrdiff_t half) {
         halve(target[half], source.Sources(row0, row1), cx);
@@ -309,11 +339,11 @@ void YUV444_2_420(unsigned char* pDst, unsigned char* pSrc, int cx, int cy) {
 void YUV420_2_444(unsigned char* pDst, unsigned char* pSrc, int w, int h) {
     if (w <= 0 || h <= 0)
         return;
-    Convert(BestRowKernels().doubled, Rows{pDst, ptrdiff_t{2} * w}, Rows{pSrc, w}, w, h);
+    Double({{pSrc, w}, w, h, 1}, {pDst, ptrdiff_t{2} * w});
 }
 
 void YUV420_2_444Ex(unsigned char* pDst, unsigned char* pSrc, int W, int H) {
     if (W <= 1 || H <= 1)
         return;
-    Convert(BestRowKernels().doubled, Rows{pDst, W}, Rows{pSrc, EvenAbove(W) / 2}, W / 2, H / 2);
+    Double({{pSrc, EvenAbove(W) / 2}, W / 2, H / 2, 1}, {pDst, W});
 }

@@ -16,6 +16,10 @@ struct Rows {
 
     uint8_t* operator[](ptrdiff_t row) const { return first + row * step; }
 
+    bool AlignedTo(ptrdiff_t bytes) const {
+        return reinterpret_cast<uintptr_t>(first) % static_cast<uintptr_t>(bytes) == 0 && step % bytes == 0;
+    }
+
     /// The same rows beginning at another row and byte.
     Rows At(ptrdiff_t row, ptrdiff_t byte) const { return {(*this)[row] + byte, step}; }
 
@@ -45,9 +49,12 @@ struct Picture {
     Rows rows;
     ptrdiff_t width;
     ptrdiff_t height;
+    ptrdiff_t pixelBytes;
+
+    int64_t Pixels() const { return int64_t{width} * height; }
 
     /// The picture without an odd last column and row.
-    Picture WholeBlocks() const { return {rows, width & ~ptrdiff_t{1}, height & ~ptrdiff_t{1}}; }
+    Picture WholeBlocks() const { return {rows, width & ~ptrdiff_t{1}, height & ~ptrdiff_t{1}, pixelBytes}; }
 };
 
 /// Calls visit(row0, row1, chromaRow) for every pair of rows. An odd last row comes as a pair with itself:

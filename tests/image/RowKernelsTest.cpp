@@ -36,7 +36,8 @@ protected:
 
     /// Runs the level's kernel and the plain one on the same rows. With `oneRow` the rows of a pair are the
     /// same row.
-    void Compare(const KernelCase& kernel, size_t width, Placement placement, Content content, bool oneRow) {
+    void Compare(const RowKernels& level, const KernelCase& kernel, size_t width, Placement placement,
+                 Content content, bool oneRow) {
         const auto isSecond = [](size_t i) { return i == 1 || i == 5; };
         const uint8_t* source[kMaxRows]{};
         for (size_t i = 0; i < kernel.sources.size(); ++i) {
@@ -56,7 +57,7 @@ protected:
             plainTarget[i] = shared ? plainTarget[i - 1] : plain[i].data();
         }
 
-        kernel.run(*kernels, target, source, static_cast<ptrdiff_t>(width));
+        kernel.run(level, target, source, static_cast<ptrdiff_t>(width));
         kernel.run(*RowKernelsFor(KernelLevel::kPlain), plainTarget, source, static_cast<ptrdiff_t>(width));
 
         for (size_t i = 0; i < kernel.targets.size(); ++i) {
@@ -75,7 +76,11 @@ protected:
             for (const Placement placement : kPlacements) {
                 for (const Content content : {Content::kRandom, Content::kExtremes}) {
                     for (const bool oneRow : {false, true}) {
-                        Compare(kernel, width, placement, content, oneRow);
+                        Compare(*kernels, kernel, width, placement, content, oneRow);
+                        const bool suitsLarge =
+                            width % kLargeWidthStep == 0 && placement != Placement::kMisaligned && width > 0;
+                        if (kernels->large != nullptr && suitsLarge && !HasFatalFailure())
+                            Compare(*kernels->large, kernel, width, placement, content, oneRow);
                         if (HasFatalFailure()) {
                             FAIL() << kernel.name << ", width " << width << ", placement "
                                    << static_cast<int>(placement) << ", content " << static_cast<int>(content)

@@ -47,8 +47,10 @@ class LaneKernels {
         for (ptrdiff_t x = 0;; x = x + blockPixels < last ? x + blockPixels : last) {
             block(x);
             if (x == last)
-                return even;
+                break;
         }
+        V::FinishRow();
+        return even;
     }
 
     /// What converts the columns from `done` on.
@@ -322,9 +324,8 @@ class LaneKernels {
             const auto weave = [](Vec at0, Vec at1, Vec at2) {
                 return V::Blend8(V::Blend8(at0, at1, V::Lane(EveryThird(1))), at2, V::Lane(EveryThird(2)));
             };
-            V::StoreLanes(p, 48, weave(blue, green, red));
-            V::StoreLanes(p + 16, 48, weave(green, red, blue));
-            V::StoreLanes(p + 32, 48, weave(red, blue, green));
+            const Vec parts[3] = {weave(blue, green, red), weave(green, red, blue), weave(red, blue, green)};
+            V::StoreLanes(p, parts);
         }
     };
 
@@ -336,17 +337,17 @@ class LaneKernels {
             const Vec fourth = V::Set8(-1);
             const Vec blueGreen[2] = {V::UnpackLo8(c.blue, c.green), V::UnpackHi8(c.blue, c.green)};
             const Vec redFourth[2] = {V::UnpackLo8(c.red, fourth), V::UnpackHi8(c.red, fourth)};
-            for (int half = 0; half < 2; ++half) {
-                StoreQuad(p + 32 * half, V::UnpackLo16(blueGreen[half], redFourth[half]));
-                StoreQuad(p + 32 * half + 16, V::UnpackHi16(blueGreen[half], redFourth[half]));
+            Vec quads[4] = {
+                V::UnpackLo16(blueGreen[0], redFourth[0]), V::UnpackHi16(blueGreen[0], redFourth[0]),
+                V::UnpackLo16(blueGreen[1], redFourth[1]), V::UnpackHi16(blueGreen[1], redFourth[1])};
+            if constexpr (kOpaque) {
+                V::StoreLanes(p, quads);
+            } else {
+                const Vec kept = V::Set32(static_cast<int32_t>(0xFF000000));
+                for (int quad = 0; quad < 4; ++quad)
+                    quads[quad] = V::Blend8(quads[quad], V::LoadLanes(p + 16 * quad, 64), kept);
+                V::Cached::StoreLanes(p, quads); // what has been read is in the cache
             }
-        }
-
-    private:
-        static void StoreQuad(uint8_t* p, Vec bgra) {
-            if constexpr (!kOpaque)
-                bgra = V::Blend8(bgra, V::LoadLanes(p, 64), V::Set32(static_cast<int32_t>(0xFF000000)));
-            V::StoreLanes(p, 64, bgra);
         }
     };
 
@@ -384,8 +385,8 @@ class LaneKernels {
     static void StorePacked(uint8_t* p, Vec y, Vec uv) {
         const Vec even = kOrder == kYuy2 ? y : uv;
         const Vec odd = kOrder == kYuy2 ? uv : y;
-        V::StoreLanes(p, 32, V::UnpackLo8(even, odd));
-        V::StoreLanes(p + 16, 32, V::UnpackHi8(even, odd));
+        const Vec halves[2] = {V::UnpackLo8(even, odd), V::UnpackHi8(even, odd)};
+        V::StoreLanes(p, halves);
     }
 
     template <PackedOrder kOrder>
@@ -457,8 +458,9 @@ class LaneKernels {
 
     [[gnu::flatten]] static void SwapPacked(uint8_t* target, const uint8_t* source, ptrdiff_t width) {
         constexpr LaneBytes kSwapped{1, 0, 3, 2, 5, 4, 7, 6, 9, 8, 11, 10, 13, 12, 15, 14};
-        const ptrdiff_t done = ForBlocks(width, kPixels / 2, [&](ptrdiff_t x) {
-            V::Store(target + 2 * x, V::Shuffle8(V::Load(source + 2 * x), V::Lane(kSwapped)));
+        const ptrdiff_t done = ForBlocks(width, kPixels, [&](ptrdiff_t x) {
+            for (ptrdiff_t i = 2 * x; i < 2 * x + 2 * kPixels; i += kPixels)
+                V::Store(target + i, V::Shuffle8(V::Load(source + i), V::Lane(kSwapped)));
         });
         if (done < width)
             Rest(done).swapPacked(target + 2 * done, source + 2 * done, width - done);
@@ -485,19 +487,16 @@ class LaneKernels {
     [[gnu::flatten]] static void Doubled(RowPair<uint8_t> target, const uint8_t* source, ptrdiff_t width) {
         const ptrdiff_t done = ForBlocks(width, kPixels, [&](ptrdiff_t x) {
             const Vec samples = V::Load(source + x);
-            const Vec low = V::UnpackLo8(samples, samples);
-            const Vec high = V::UnpackHi8(samples, samples);
-            for (uint8_t* const row : {target.first, target.second}) {
-                V::StoreLanes(row + 2 * x, 32, low);
-                V::StoreLanes(row + 2 * x + 16, 32, high);
-            }
+            const Vec halves[2] = {V::UnpackLo8(samples, samples), V::UnpackHi8(samples, samples)};
+            V::StoreLanes(target.first + 2 * x, halves);
+            V::StoreLanes(target.second + 2 * x, halves);
         });
         if (done < width)
             Rest(done).doubled(Advance(target, 2 * done), source + done, width - done);
     }
 
 public:
-    static constexpr RowKernels Table() {
+    static constexpr RowKernels Table(const RowKernels* large = nullptr) {
         return {
             .bgr32To420 = RgbTo420<Bgr32, FastRgbForm, &RowKernels::bgr32To420>,
             .bgr24To420 = RgbTo420<Bgr24, FastRgbForm, &RowKernels::bgr24To420>,
@@ -514,6 +513,7 @@ public:
             .swapPacked = SwapPacked,
             .halve = Halve,
             .doubled = Doubled,
+            .large = large,
         };
     }
 };

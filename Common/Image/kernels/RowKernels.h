@@ -62,7 +62,15 @@ struct RowKernels {
     // width is the last one again. Doubling writes every sample to two columns of two rows.
     HalveRows halve;
     DoubleRow doubled;
+
+    /// The same kernels for outputs that no cache holds: they write past the caches. That pays where one or
+    /// two rows are written, not where those of three or four planes are. The width is a multiple of
+    /// kLargeWidthStep and every target row begins at a multiple of kLargeAlignment. Null: none.
+    const RowKernels* large = nullptr;
 };
+
+inline constexpr ptrdiff_t kLargeWidthStep = 32;
+inline constexpr ptrdiff_t kLargeAlignment = 16;
 
 enum class KernelLevel { kPlain, kSse41, kAvx2, kAvx512 };
 inline constexpr KernelLevel kKernelLevels[] = {KernelLevel::kPlain, KernelLevel::kSse41, KernelLevel::kAvx2,

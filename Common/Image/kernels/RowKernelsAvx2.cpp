@@ -8,30 +8,12 @@ namespace {
 
 struct Avx2 {
     using Vec = __m256i;
+    using Cached = Avx2;
 
     static const RowKernels& Lower() { return kSse41Kernels; }
 
-    static __m128i LoadLane(const uint8_t* p) { return _mm_loadu_si128(reinterpret_cast<const __m128i*>(p)); }
-    static void StoreLane(uint8_t* p, __m128i a) { _mm_storeu_si128(reinterpret_cast<__m128i*>(p), a); }
-
-    static Vec Load(const uint8_t* p) { return _mm256_loadu_si256(reinterpret_cast<const Vec*>(p)); }
-    static Vec LoadLanes(const uint8_t* p, ptrdiff_t distance) {
-        return _mm256_inserti128_si256(_mm256_castsi128_si256(LoadLane(p)), LoadLane(p + distance), 1);
-    }
-    static Vec LoadWords(const uint8_t* p) { return _mm256_cvtepu8_epi16(LoadLane(p)); }
-    static void Store(uint8_t* p, Vec a) { _mm256_storeu_si256(reinterpret_cast<Vec*>(p), a); }
-    static void StoreLanes(uint8_t* p, ptrdiff_t distance, Vec a) {
-        StoreLane(p, _mm256_castsi256_si128(a));
-        StoreLane(p + distance, _mm256_extracti128_si256(a, 1));
-    }
-    static void StoreHalves(uint8_t* low, uint8_t* high, Vec a) {
-        const Vec halves = _mm256_permute4x64_epi64(a, _MM_SHUFFLE(3, 1, 2, 0));
-        StoreLane(low, _mm256_castsi256_si128(halves));
-        StoreLane(high, _mm256_extracti128_si256(halves, 1));
-    }
-
     static Vec Lane(const LaneBytes& bytes) {
-        return _mm256_broadcastsi128_si256(LoadLane(reinterpret_cast<const uint8_t*>(bytes.data())));
+        return _mm256_broadcastsi128_si256(_mm_loadu_si128(reinterpret_cast<const __m128i*>(bytes.data())));
     }
     static Vec Set8(int value) { return _mm256_set1_epi8(static_cast<char>(value)); }
     static Vec Set16(int value) { return _mm256_set1_epi16(static_cast<int16_t>(value)); }
@@ -87,10 +69,78 @@ struct Avx2 {
     static Vec Srl64(Vec a) {
         return _mm256_srli_epi64(a, kBits);
     }
+
+    static __m128i LoadLane(const uint8_t* p) { return _mm_loadu_si128(reinterpret_cast<const __m128i*>(p)); }
+    static __m128i LowLane(Vec a) { return _mm256_castsi256_si128(a); }
+    static __m128i HighLane(Vec a) { return _mm256_extracti128_si256(a, 1); }
+    static Vec Join(__m128i low, __m128i high) {
+        return _mm256_inserti128_si256(_mm256_castsi128_si256(low), high, 1);
+    }
+
+    static Vec Load(const uint8_t* p) { return _mm256_loadu_si256(reinterpret_cast<const Vec*>(p)); }
+    static Vec LoadLanes(const uint8_t* p, ptrdiff_t distance) {
+        return Join(LoadLane(p), LoadLane(p + distance));
+    }
+    static Vec LoadWords(const uint8_t* p) { return _mm256_cvtepu8_epi16(LoadLane(p)); }
+
+    static void Store(uint8_t* p, Vec a) { _mm256_storeu_si256(reinterpret_cast<Vec*>(p), a); }
+    static void StoreLane(uint8_t* p, __m128i a) { _mm_storeu_si128(reinterpret_cast<__m128i*>(p), a); }
+    static void StoreHalves(uint8_t* low, uint8_t* high, Vec a) {
+        const Vec halves = _mm256_permute4x64_epi64(a, _MM_SHUFFLE(3, 1, 2, 0));
+        StoreLane(low, LowLane(halves));
+        StoreLane(high, HighLane(halves));
+    }
+
+    static Vec LowLanes(Vec a, Vec b) { return _mm256_permute2x128_si256(a, b, 0x20); }
+    static Vec HighLanes(Vec a, Vec b) { return _mm256_permute2x128_si256(a, b, 0x31); }
+
+    static void StoreLanes(uint8_t* p, const Vec (&parts)[2]) {
+        Store(p, LowLanes(parts[0], parts[1]));
+        Store(p + 32, HighLanes(parts[0], parts[1]));
+    }
+    static void StoreLanes(uint8_t* p, const Vec (&parts)[3]) {
+        Store(p, LowLanes(parts[0], parts[1]));
+        Store(p + 32, _mm256_blend_epi32(parts[2], parts[0], 0xF0));
+        Store(p + 64, HighLanes(parts[1], parts[2]));
+    }
+    static void StoreLanes(uint8_t* p, const Vec (&parts)[4]) {
+        Store(p, LowLanes(parts[0], parts[1]));
+        Store(p + 32, LowLanes(parts[2], parts[3]));
+        Store(p + 64, HighLanes(parts[0], parts[1]));
+        Store(p + 96, HighLanes(parts[2], parts[3]));
+    }
+
+    static void FinishRow() {}
 };
+
+/// Targets that no cache holds: written past the caches. Sixteen bytes a store, because that is as far as
+/// allocated memory is aligned.
+struct Avx2Large : Avx2 {
+    static void StoreLane(uint8_t* p, __m128i a) { _mm_stream_si128(reinterpret_cast<__m128i*>(p), a); }
+    static void Store(uint8_t* p, Vec a) {
+        StoreLane(p, LowLane(a));
+        StoreLane(p + 16, HighLane(a));
+    }
+    static void StoreHalves(uint8_t* low, uint8_t* high, Vec a) {
+        const Vec halves = _mm256_permute4x64_epi64(a, _MM_SHUFFLE(3, 1, 2, 0));
+        StoreLane(low, LowLane(halves));
+        StoreLane(high, HighLane(halves));
+    }
+    template <size_t kParts>
+    static void StoreLanes(uint8_t* p, const Vec (&parts)[kParts]) {
+        for (size_t i = 0; i < kParts; ++i)
+            StoreLane(p + 16 * i, LowLane(parts[i]));
+        for (size_t i = 0; i < kParts; ++i)
+            StoreLane(p + 16 * (kParts + i), HighLane(parts[i]));
+    }
+
+    static void FinishRow() { _mm_sfence(); }
+};
+
+constexpr RowKernels kLargeKernels = LaneKernels<Avx2Large>::Table();
 
 } // namespace
 
-constinit const RowKernels kAvx2Kernels = LaneKernels<Avx2>::Table();
+constinit const RowKernels kAvx2Kernels = LaneKernels<Avx2>::Table(&kLargeKernels);
 
 } // namespace image

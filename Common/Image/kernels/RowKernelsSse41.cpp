@@ -8,6 +8,7 @@ namespace {
 
 struct Sse41 {
     using Vec = __m128i;
+    using Cached = Sse41;
 
     static const RowKernels& Lower() { return kPlainKernels; }
 
@@ -17,11 +18,17 @@ struct Sse41 {
         return _mm_cvtepu8_epi16(_mm_loadl_epi64(reinterpret_cast<const Vec*>(p)));
     }
     static void Store(uint8_t* p, Vec a) { _mm_storeu_si128(reinterpret_cast<Vec*>(p), a); }
-    static void StoreLanes(uint8_t* p, ptrdiff_t, Vec a) { Store(p, a); }
+    template <size_t kParts>
+    static void StoreLanes(uint8_t* p, const Vec (&parts)[kParts]) {
+        for (size_t i = 0; i < kParts; ++i)
+            Store(p + 16 * i, parts[i]);
+    }
     static void StoreHalves(uint8_t* low, uint8_t* high, Vec a) {
         _mm_storel_epi64(reinterpret_cast<Vec*>(low), a);
         _mm_storel_epi64(reinterpret_cast<Vec*>(high), _mm_unpackhi_epi64(a, a));
     }
+
+    static void FinishRow() {}
 
     static Vec Lane(const LaneBytes& bytes) {
         return _mm_loadu_si128(reinterpret_cast<const Vec*>(bytes.data()));
