@@ -25,9 +25,6 @@ void Movie::Stop() {
 
 std::vector<std::string> Movie::Complaints() const {
     std::vector<std::string> texts;
-    if (const std::string error = demuxer_.ReadError(); !error.empty()) {
-        texts.push_back(fmt::format("reading stopped before the end of the source: {}", error));
-    }
     if (const int jumps = demuxer_.ClockJumps(); jumps > 0) {
         texts.push_back(fmt::format("the source's clock jumped {} times; the parts were joined", jumps));
     }

@@ -30,6 +30,9 @@ public:
     /// Seconds of sound handed out since the begin time; 0 without sound. Any thread.
     double SoundSeconds() const { return sound_ ? sound_->SecondsDelivered() : 0; }
 
+    /// Why reading ended before the end of the source; empty when it did not. Any thread.
+    std::string ReadError() const { return demuxer_.ReadError(); }
+
     /// What was wrong with the movie and has been put right or skipped, a sentence each. Once both streams
     /// ended.
     std::vector<std::string> Complaints() const;

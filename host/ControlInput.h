@@ -1,0 +1,47 @@
+// Signals and keys, received on a thread of their own and passed on as events.
+#ifndef MOVIECONV_HOST_CONTROLINPUT_H
+#define MOVIECONV_HOST_CONTROLINPUT_H
+
+#include <atomic>
+#include <thread>
+
+namespace host {
+
+/// Exists once. Must be made before any other thread, because it blocks the signals that it receives.
+///
+/// SIGINT, SIGTERM and SIGHUP: before Arm, and from the second one on, the program leaves at once with the
+/// shell's code for the signal; the first one after Arm becomes kStop. On a terminal the keys space and p
+/// become kPauseKey, q and Q kStop.
+class ControlInput {
+public:
+    ControlInput();
+    ~ControlInput();
+    ControlInput(const ControlInput&) = delete;
+    ControlInput& operator=(const ControlInput&) = delete;
+
+    /// From now on there is something to finish. Starts to listen to the keyboard if `keys` and there is one.
+    void Arm(bool keys);
+
+    /// Suspends the whole process as the terminal asked, with the terminal as it was found, and returns when
+    /// it goes on.
+    void Suspend();
+
+private:
+    void Run();
+    void TakeSignal();
+    void TakeKeys();
+    void LeaveAtOnce(int signal);
+    void UseKeyboard();
+    void RestoreTerminal();
+
+    int signals_ = -1;
+    int wake_ = -1;
+    std::atomic<bool> armed_{false};
+    std::atomic<bool> keys_{false};
+    bool stopAsked_ = false; // the thread's
+    std::thread thread_;
+};
+
+} // namespace host
+
+#endif

@@ -1,0 +1,83 @@
+// One conversion, from the first look at the output to the exit code. It drives the engine through its MC
+// functions and learns what happens through the main event queue: the engine's events, its callback's, the
+// media writer's news, signals and keys all arrive there.
+#ifndef MOVIECONV_HOST_CONVERSION_H
+#define MOVIECONV_HOST_CONVERSION_H
+
+#include "api/MovieConv.h"
+#include "host/ControlInput.h"
+#include "host/FileLedger.h"
+#include "host/HostEvents.h"
+#include "host/Movie.h"
+#include "host/Options.h"
+#include "host/Preview.h"
+#include "host/Reporter.h"
+#include "host/SpeedMeter.h"
+#include "host/WorkClock.h"
+#include "host/WriterWatch.h"
+
+#include <atomic>
+#include <memory>
+#include <optional>
+#include <string>
+
+namespace host {
+
+struct ConverterFree {
+    void operator()(void* converter) const { MCDestroy(converter); }
+};
+using Converter = std::unique_ptr<void, ConverterFree>;
+
+/// A converter for the movie with its parameters set as the options ask. Throws Failure.
+Converter MakeConverter(const Options& options, Movie& movie);
+
+class Conversion {
+public:
+    Conversion(const Options& options, Movie& movie, Reporter& reporter, ControlInput& control);
+    Conversion(const Conversion&) = delete;
+    Conversion& operator=(const Conversion&) = delete;
+
+    /// Converts and reports. Throws Failure when it cannot begin.
+    ExitCode Run();
+
+private:
+    static unsigned OnProgress(void* context, unsigned kind, unsigned value, uintptr_t info);
+
+    void WarnOfSmallRoom();
+    void WaitForEnd();
+    void Handle(const Event& event);
+    void TakeNews();
+    void Stop();
+    void TogglePause();
+    void Suspend();
+    void UpdateClock();
+    ProgressReport Figures();
+    void ReportProgress();
+    ExitCode Conclude();
+    std::optional<Failure> Verdict();
+    void ReportComplaints();
+
+    const Options& options_;
+    Movie& movie_;
+    Reporter& reporter_;
+    ControlInput& control_;
+    const double length_;
+    WriterWatch watch_;
+    FileLedger files_;
+    std::optional<Preview> preview_;
+    Converter converter_;
+
+    std::atomic<double> position_{0}; // the engine's, in seconds
+
+    WorkClock clock_;
+    SpeedMeter speed_;
+    bool paused_ = false;
+    bool userStopped_ = false;
+    bool finished_ = false;
+    unsigned outcome_ = kOutcomeFailed;
+    Phase shownPhase_ = Phase::kConverting;
+};
+
+} // namespace host
+
+#endif

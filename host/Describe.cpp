@@ -1,0 +1,41 @@
+#include "host/Describe.h"
+
+#include "host/Units.h"
+
+#include <fmt/format.h>
+
+namespace host {
+namespace {
+
+std::string DescribePictures(const PictureStreamInfo& pictures) {
+    std::string text = fmt::format("pictures:  {}, {} x {}, {:.3f} a second, {}, {}", pictures.codec,
+                                   pictures.width, pictures.height, pictures.frameRate, pictures.pixelFormat,
+                                   FormatTime(pictures.duration, true));
+    if (pictures.pixelAspect.num != pictures.pixelAspect.den) {
+        text += fmt::format(", pixels {}:{}", pictures.pixelAspect.num, pictures.pixelAspect.den);
+    }
+    if (pictures.quarterTurns != 0 || pictures.mirrored) {
+        text += fmt::format(", {}turned by {} degrees", pictures.mirrored ? "mirrored, " : "",
+                            pictures.quarterTurns * 90);
+    }
+    return text + (pictures.interlaced ? ", interlaced\n" : "\n");
+}
+
+} // namespace
+
+std::string Describe(const SourceInfo& source) {
+    std::string text = fmt::format("file:      {} ({})\ncontainer: {}\nlength:    {}\n", source.path,
+                                   FormatBytes(source.bytes), source.container,
+                                   source.durationKnown ? FormatTime(source.duration, true) : "unknown");
+    text += source.pictures ? DescribePictures(*source.pictures) : "pictures:  none\n";
+    if (source.sound) {
+        text += fmt::format("sound:     {}, {} Hz, {} ({} channels), {}\n", source.sound->codec,
+                            source.sound->sampleRate, source.sound->layout, source.sound->channels,
+                            FormatTime(source.sound->duration, true));
+    } else {
+        text += "sound:     none\n";
+    }
+    return text;
+}
+
+} // namespace host

@@ -1,0 +1,24 @@
+// Looks at the output's place before anything is written.
+#ifndef MOVIECONV_HOST_OUTPUTCHECK_H
+#define MOVIECONV_HOST_OUTPUTCHECK_H
+
+#include "host/Options.h"
+
+#include <cstdint>
+#include <string>
+
+namespace host {
+
+/// Throws Failure when the output, or a clip of it, would replace the input or an existing file without
+/// leave, cannot be written where it is to go, or has a name of which no clip names can be made.
+void CheckOutput(const Options& options);
+
+/// The folder of a path, "." for a plain name.
+std::string FolderOf(const std::string& path);
+
+/// Bytes that an ordinary user can still write to the file system of `folder`; -1 when it cannot be told.
+int64_t FreeBytes(const std::string& folder);
+
+} // namespace host
+
+#endif

@@ -1,0 +1,58 @@
+// What the media writer tells about its files, brought from its threads to the main thread.
+#ifndef MOVIECONV_HOST_WRITERWATCH_H
+#define MOVIECONV_HOST_WRITERWATCH_H
+
+#include "host/Options.h"
+#include "host/Source.h"
+#include "writer/WriterStatus.h"
+
+#include <atomic>
+#include <condition_variable>
+#include <cstdint>
+#include <deque>
+#include <mutex>
+#include <optional>
+
+namespace host {
+
+/// Sets the writer's options for as long as it exists. There is one at a time.
+class WriterWatch {
+public:
+    struct News {
+        int event; ///< kWriterEvent...
+        WriterStatus status;
+    };
+
+    WriterWatch(const Options& options, const SourceInfo& source);
+    ~WriterWatch();
+    WriterWatch(const WriterWatch&) = delete;
+    WriterWatch& operator=(const WriterWatch&) = delete;
+
+    /// The oldest news that was not taken yet.
+    std::optional<News> Take();
+
+    /// Whether the writer waits for room on a full disk.
+    bool WaitsForRoom() const { return waiting_; }
+
+    /// Ends that waiting: the file fails.
+    void GiveUp();
+
+    /// Bytes of all files created since this object was made, as they stand.
+    int64_t Bytes() const;
+
+private:
+    static void OnEvent(void* context, int event, const WriterStatus* status);
+    static int OnFullDisk(void* context, const WriterStatus* status);
+    int WaitForRoom(const WriterStatus& status);
+
+    mutable std::mutex mutex_;
+    std::condition_variable changed_;
+    std::deque<News> news_;
+    bool givenUp_ = false;
+    std::atomic<bool> waiting_{false};
+    std::atomic<int64_t> closedBytes_{0};
+};
+
+} // namespace host
+
+#endif

@@ -1,0 +1,85 @@
+#include "host/ControlInput.h"
+#include "host/Conversion.h"
+#include "host/Describe.h"
+#include "host/EncodePlan.h"
+#include "host/Formats.h"
+#include "host/OutputCheck.h"
+#include "host/Reporter.h"
+#include "host/StandardStreams.h"
+#include "host/Units.h"
+
+#include <cstdio>
+#include <exception>
+#include <fmt/format.h>
+
+namespace host {
+namespace {
+
+ExitCode Estimate(const Options& options, Movie& movie, const StandardStreams& streams) {
+    const double length = LengthToConvert(options, movie.Info());
+    const Converter converter = MakeConverter(options, movie);
+    EncodeParam param{};
+    MCGetEncodeParam(converter.get(), &param);
+    const int64_t needed = MCGetEstimateDiskSpaceEx(&param, length);
+    const std::string folder = FolderOf(options.output);
+    const int64_t free = FreeBytes(folder);
+    streams.Print(
+        fmt::format("needs about {} for {} of output\n", FormatBytes(needed), FormatTime(length, true)));
+    if (free < 0) {
+        throw Failure(ExitCode::kCannotWrite,
+                      fmt::format("the output's folder \"{}\" cannot be used", folder));
+    }
+    streams.Print(fmt::format("{} are free in \"{}\"\n", FormatBytes(free), folder));
+    return needed <= free ? ExitCode::kDone : ExitCode::kNoSpace;
+}
+
+ExitCode Perform(const Options& options, const StandardStreams& streams, ControlInput& control) {
+    const SourceChoice choice{.pictures = !options.noVideo, .sound = !options.noAudio};
+    if (options.task == Task::kListFormats) {
+        streams.Print(ListFormats());
+        return ExitCode::kDone;
+    }
+    if (options.task == Task::kInfo) {
+        streams.Print(Describe(Source(options.input, choice).Info()));
+        return ExitCode::kDone;
+    }
+    ChooseFormat(options);
+    if (options.task == Task::kConvert) {
+        CheckOutput(options);
+    }
+    Movie movie(options.input, choice);
+    if (options.task == Task::kEstimate) {
+        return Estimate(options, movie, streams);
+    }
+    const std::unique_ptr<Reporter> reporter = MakeReporter(options, streams);
+    return Conversion(options, movie, *reporter, control).Run();
+}
+
+int Main(int argc, char** argv) {
+    const std::optional<Options> options = ParseOptions(argc, argv);
+    if (!options) {
+        return static_cast<int>(ExitCode::kDone);
+    }
+    ControlInput control;
+    const StandardStreams streams(options->log);
+    try {
+        return static_cast<int>(Perform(*options, streams, control));
+    } catch (const SourceError& error) {
+        throw Failure(ExitCode::kCannotRead, error.what());
+    }
+}
+
+} // namespace
+} // namespace host
+
+int main(int argc, char** argv) {
+    try {
+        return host::Main(argc, argv);
+    } catch (const host::Failure& failure) {
+        std::fprintf(stderr, "movieconv: error: %s\n", failure.what());
+        return static_cast<int>(failure.Code());
+    } catch (const std::exception& error) {
+        std::fprintf(stderr, "movieconv: internal error: %s\n", error.what());
+        return static_cast<int>(host::ExitCode::kInternal);
+    }
+}
