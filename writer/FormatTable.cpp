@@ -45,9 +45,9 @@ constexpr std::array kVideoCodecs{
 
 // The limits of AAC are the format's (6144 bits for a frame of 1024 samples), those of the others their encoders'.
 constexpr std::array kAudioCodecs{
-    AudioCodec{kAac,    AV_CODEC_ID_AAC,       "aac",        8, 0.0, 6.0},
-    AudioCodec{kMp3,    AV_CODEC_ID_MP3,       "libmp3lame", 2, 0.0, 8.0},
-    AudioCodec{kAc3,    AV_CODEC_ID_AC3,       "ac3",        6, 0.0, 14.0},
+    AudioCodec{kAac,    AV_CODEC_ID_AAC,       "aac",        8, 0.5, 6.0},
+    AudioCodec{kMp3,    AV_CODEC_ID_MP3,       "libmp3lame", 2, 0.5, 8.0},
+    AudioCodec{kAc3,    AV_CODEC_ID_AC3,       "ac3",        6, 0.5, 14.0},
     AudioCodec{kFlac,   AV_CODEC_ID_FLAC,      "flac",       8, 0.0, 0.0},
     AudioCodec{kOpus,   AV_CODEC_ID_OPUS,      "libopus",    8, 0.2, 5.3},
     AudioCodec{kVorbis, AV_CODEC_ID_VORBIS,    "libvorbis",  8, 1.0, 3.8},

@@ -79,9 +79,8 @@ MediaFile::MediaFile(const std::string& target, const EncodeParam& param, const 
     try {
         OpenStages();
     } catch (...) {
-        const WriterFailure failure = Explain(std::current_exception());
         files_.Remove(partPath_);
-        throw failure;
+        throw WriterFailure(Explain(std::current_exception()));
     }
     record_->SetTemporaryPath(partPath_);
     StartPictures();

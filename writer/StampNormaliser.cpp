@@ -8,7 +8,7 @@ namespace writer {
 namespace {
 
 /// Sound that may come before the first picture of a file until the file is taken to begin with its sound.
-constexpr int64_t kLongestWait = kUnitsPerSecond / 2;
+constexpr int64_t kLongestWait = 10 * kUnitsPerSecond;
 
 /// How far ahead of all sound a picture can be and still be on the sound's timeline: sound is always written
 /// first.

@@ -33,8 +33,8 @@ public:
     /// Nothing more will come; decides where the sound begins if that is still open.
     void Finish();
 
-    /// Time in the file of the first sample, at least 0. Open until a picture has come after sound, or half a
-    /// second of sound without a picture; once set it stays.
+    /// Time in the file of the first sample, at least 0. Open until a picture has come after sound, or ten
+    /// seconds of sound without a picture; once set it stays.
     std::optional<int64_t> SoundStart() const { return soundStart_; }
 
     /// Length of the sound so far.

@@ -216,7 +216,7 @@ TEST(StampNormaliser, SoundAloneBeginsAtZero) {
     StampNormaliser waiting(400'000, true);
     waiting.AddSound(0, 1000, 176'400, false);
     EXPECT_FALSE(waiting.SoundStart().has_value());
-    waiting.AddSound(0, 176'400, 176'400, false);
+    waiting.AddSound(0, 10 * 176'400, 176'400, false);
     EXPECT_EQ(waiting.SoundStart(), 0);
 }
 
