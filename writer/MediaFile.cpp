@@ -278,14 +278,15 @@ void MediaFile::FinishPart() {
     muxer_->WriteTrailer();
     if (part_->Flush() != 0)
         throw WriterFailure(kWriterErrorWrite, "");
-    record_->Update([this](WriterStatus& status) {
+    const double pictures = pictureStream_ < 0 ? 0.0 : muxer_->Stream(pictureStream_).seconds;
+    const double sound = soundStream_ < 0 ? 0.0 : muxer_->Stream(soundStream_).seconds;
+    record_->Update([&](WriterStatus& status) {
         status.llBytesWritten = part_->Size();
-        status.dVideoWritten = pictureStream_ < 0 ? 0.0 : muxer_->Stream(pictureStream_).seconds;
+        status.dVideoWritten = pictures;
         // Some codecs count the padding of the last frame.
         const double encoded =
             sound_ ? static_cast<double>(status.llSamplesWritten) / status.nSampleRate : 0.0;
-        status.dAudioWritten =
-            soundStream_ < 0 ? 0.0 : std::min(encoded, muxer_->Stream(soundStream_).seconds);
+        status.dAudioWritten = std::min(encoded, sound);
     });
     if (!IsFragmented(plan_)) {
         Publish(partPath_, *part_->File());
