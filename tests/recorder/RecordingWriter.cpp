@@ -24,31 +24,31 @@ std::mutex g_mutex;
 std::condition_variable g_changed;
 State g_state;
 
-uint32_t Digest(uint32_t digest, const unsigned char* data, int32_t length) {
-    for (int32_t i = 0; i < length; ++i)
+constexpr uint32_t kDigestStart = 2166136261;
+
+uint32_t AddToDigest(uint32_t digest, const unsigned char* data, size_t length) {
+    for (size_t i = 0; i < length; ++i)
         digest = (digest ^ data[i]) * 16777619; // FNV-1a
     return digest;
 }
 
-uint32_t DigestPlane(uint32_t digest, const unsigned char* plane, int32_t pitch, int32_t width,
-                     int32_t height) {
+uint32_t AddPlane(uint32_t digest, const unsigned char* plane, int32_t pitch, int32_t width, int32_t height) {
     for (int32_t y = 0; plane && y < height; ++y)
-        digest = Digest(digest, plane + static_cast<ptrdiff_t>(y) * pitch, width);
+        digest = AddToDigest(digest, plane + static_cast<ptrdiff_t>(y) * pitch, static_cast<size_t>(width));
     return digest;
 }
 
-constexpr uint32_t kDigestStart = 2166136261;
-
-uint32_t Digest(const AudioFrame& frame) {
-    return Digest(kDigestStart, frame.pData, frame.pData ? frame.nLength : 0);
+uint32_t DigestOf(const AudioFrame& frame) {
+    return recorder::Digest(frame.pData,
+                            frame.pData && frame.nLength > 0 ? static_cast<size_t>(frame.nLength) : 0);
 }
 
-uint32_t Digest(const VideoImage& image) {
+uint32_t DigestOf(const VideoImage& image) {
     const int32_t halfWidth = (image.nWidth + 1) / 2;
     const int32_t halfHeight = (image.nHeight + 1) / 2;
-    uint32_t digest = DigestPlane(kDigestStart, image.pY, image.nPitchY, image.nWidth, image.nHeight);
-    digest = DigestPlane(digest, image.pU, image.nPitchU, halfWidth, halfHeight);
-    return DigestPlane(digest, image.pV, image.nPitchV, halfWidth, halfHeight);
+    uint32_t digest = AddPlane(kDigestStart, image.pY, image.nPitchY, image.nWidth, image.nHeight);
+    digest = AddPlane(digest, image.pU, image.nPitchU, halfWidth, halfHeight);
+    return AddPlane(digest, image.pV, image.nPitchV, halfWidth, halfHeight);
 }
 
 std::string Utf8(const wchar_t* text) {
@@ -94,6 +94,10 @@ void WaitWhileBlocking(std::unique_lock<std::mutex>& guard) {
 } // namespace
 
 namespace recorder {
+
+uint32_t Digest(const unsigned char* data, size_t length) {
+    return AddToDigest(kDigestStart, data, length);
+}
 
 void Reset() {
     const std::lock_guard guard(g_mutex);
@@ -180,7 +184,7 @@ void* MWCreateMediaFile(const wchar_t* fileName, const EncodeParam* param, const
 int MWWriteVideoFrame(void* file, const VideoImage* image) {
     std::unique_lock guard(g_mutex);
     WaitWhileBlocking(guard);
-    g_state.pictures.push_back({Number(file), *image, Digest(*image)});
+    g_state.pictures.push_back({Number(file), *image, DigestOf(*image)});
     g_state.trace.push_back(Format("picture #%d %lld", Number(file), static_cast<long long>(image->llTime)));
     return file != nullptr;
 }
@@ -188,7 +192,7 @@ int MWWriteVideoFrame(void* file, const VideoImage* image) {
 int MWWriteAudioData(void* file, const AudioFrame* frame) {
     std::unique_lock guard(g_mutex);
     WaitWhileBlocking(guard);
-    g_state.sounds.push_back({Number(file), *frame, Digest(*frame)});
+    g_state.sounds.push_back({Number(file), *frame, DigestOf(*frame)});
     g_state.trace.push_back(Format("%s #%d %lld +%d", frame->nType == kMediaTypeSilence ? "silence" : "sound",
                                    Number(file), static_cast<long long>(frame->llTime), frame->nLength));
     return file != nullptr;

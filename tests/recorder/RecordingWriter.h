@@ -10,6 +10,8 @@
 #include "media/EncodeParam.h"
 #include "media/MediaRecords.h"
 
+#include <cstddef>
+#include <cstdint>
 #include <functional>
 #include <set>
 #include <string>
@@ -28,6 +30,9 @@ struct Written {
     Record record;
     uint32_t digest;
 };
+
+/// A digest as the records carry it.
+uint32_t Digest(const unsigned char* data, size_t length);
 
 /// Forgets all recordings and everything that was set below.
 void Reset();

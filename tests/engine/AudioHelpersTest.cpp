@@ -1,0 +1,159 @@
+// The helpers for a host that plays the sound itself.
+#include "tests/engine/ScriptedHost.h"
+
+#include <gtest/gtest.h>
+
+#include <climits>
+
+namespace {
+
+/// Hands out one block after the other.
+class Blocks : public AudioDecoder {
+public:
+    AudioSourceInfo* GetAudioInfo() override { return &info; }
+    double Seek(double) override { return 0.0; }
+    AudioFrame* GetNextFrame() override { return next < blocks.size() ? &blocks[next++] : nullptr; }
+
+    void Add(int32_t rate, int32_t channels, int32_t bits, int32_t length, int64_t time) {
+        AudioFrame block{};
+        block.nType = 5;
+        block.nSampleRate = rate;
+        block.nChannels = channels;
+        block.nBitsPerSample = bits;
+        block.pData = data;
+        block.nLength = length;
+        block.nBufferSize = length + 100;
+        block.reserved[3] = 77;
+        block.llTime = time;
+        block.llTime2 = time + 1;
+        block.nDuration = 99;
+        blocks.push_back(block);
+    }
+
+    AudioSourceInfo info{};
+    std::vector<AudioFrame> blocks;
+    unsigned char data[100000] = {};
+
+private:
+    size_t next = 0;
+};
+
+struct Piece {
+    int32_t offset, length;
+    int64_t time;
+    int32_t duration;
+};
+
+class SmallFrameTest : public testing::Test {
+protected:
+    SmallFrameTest() { get_small_frame(nullptr); }
+
+    void ExpectPieces(const std::vector<Piece>& pieces) {
+        for (const Piece& piece : pieces) {
+            SCOPED_TRACE(testing::Message() << piece.offset << " " << piece.length);
+            const AudioFrame* frame = get_small_frame(&decoder);
+            ASSERT_NE(frame, nullptr);
+            EXPECT_EQ(frame->pData, decoder.data + piece.offset);
+            EXPECT_EQ(frame->nLength, piece.length);
+            EXPECT_EQ(frame->nBufferSize, piece.length);
+            EXPECT_EQ(frame->llTime, piece.time);
+            EXPECT_EQ(frame->llTime2, piece.time);
+            EXPECT_EQ(frame->nDuration, piece.duration);
+            EXPECT_EQ(frame->nType, 5);
+            EXPECT_EQ(frame->reserved[3], 77);
+        }
+    }
+
+    Blocks decoder;
+};
+
+TEST_F(SmallFrameTest, CutsPiecesOf30Milliseconds) {
+    decoder.Add(44100, 2, 16, 35280, 1000);
+    ExpectPieces({{0, 5292, 1000, 300000},
+                  {5292, 5292, 301000, 300000},
+                  {10584, 5292, 601000, 300000},
+                  {15876, 5292, 901000, 300000},
+                  {21168, 5292, 1201000, 300000},
+                  {26460, 5292, 1501000, 300000},
+                  {31752, 3528, 1801000, 200000}});
+    EXPECT_EQ(get_small_frame(&decoder), nullptr);
+    EXPECT_EQ(get_small_frame(&decoder), nullptr);
+}
+
+TEST_F(SmallFrameTest, CutsFrom50MillisecondsOn) {
+    decoder.Add(8000, 1, 8, 400, 0); // 50 ms
+    decoder.Add(8000, 1, 8, 399, 900000);
+    decoder.Add(8000, 1, 8, 0, 5);
+    decoder.Add(8000, 1, 8, 1, -20);
+    ExpectPieces({{0, 240, 0, 300000},
+                  {240, 160, 300000, 200000},
+                  {0, 399, 900000, 498750},
+                  {0, 0, 5, 0},
+                  {0, 1, -20, 1250}});
+}
+
+TEST_F(SmallFrameTest, ResetForgetsTheBlock) {
+    decoder.Add(8000, 1, 8, 800, 0);
+    decoder.Add(8000, 1, 8, 100, 7);
+    ExpectPieces({{0, 240, 0, 300000}});
+    EXPECT_EQ(get_small_frame(nullptr), nullptr);
+    ExpectPieces({{0, 100, 7, 125000}});
+}
+
+// Blocks of formats that make no sense come to an end, too.
+TEST_F(SmallFrameTest, AlwaysComesToAnEnd) {
+    const int32_t values[] = {INT_MIN, -1, 0, 1, 3, 50, INT_MAX};
+    for (const int32_t rate : values)
+        for (const int32_t channels : values)
+            for (const int32_t bits : values)
+                decoder.Add(rate, channels, bits, 1000, INT64_MAX);
+    const size_t limit = decoder.blocks.size() * 1001;
+    size_t pieces = 0;
+    for (const AudioFrame* frame; (frame = get_small_frame(&decoder)) != nullptr; ++pieces) {
+        ASSERT_LT(pieces, limit);
+        ASSERT_GT(frame->nLength, 0);
+        ASSERT_LE(frame->pData + frame->nLength, decoder.data + 1000);
+    }
+}
+
+struct Stereo {
+    int bits, channels, count;
+    std::vector<short> written;
+    int result;
+};
+
+TEST(StereoTest, WidensAndDoubles) {
+    const Stereo cases[] = {
+        {8, 1, 3, {0, 0, 16384, 16384, 32640, 32640}, 6},
+        {8, 2, 4, {0, 16384, 32640, 128}, 4},
+        {8, 3, 2, {0, 0, 16384, 16384}, 0},
+        {16, 2, 2, {-32768, 511}, 2},
+        {16, 1, 2, {-32768, -32768, 511, 511}, 4},
+        {16, 6, 1, {-32768, -32768}, 0},
+        {24, 2, 2, {}, 2},
+        {24, 1, 1, {-32768, -32768}, 2},
+        {16, 0, 2, {}, 0},
+        {8, 0, 2, {}, 0},
+        {16, 2, 0, {}, 0},
+        {16, 1, -1, {}, -2},
+    };
+    unsigned char bytes8[] = {0, 128, 255, 1};
+    unsigned char bytes16[] = {99, 0, 128, 255, 1}; // -32768 and 511 from an odd address on
+    for (const Stereo& test : cases) {
+        SCOPED_TRACE(testing::Message() << test.bits << " bits, " << test.channels << " channels");
+        std::vector<short> destination(8, 0x5555);
+        unsigned char* source = test.bits == 8 ? bytes8 : bytes16 + 1;
+        EXPECT_EQ(ConvertTo16BitsStero(destination.data(), test.bits, test.channels, source, test.count),
+                  test.result);
+        std::vector<short> expected = test.written;
+        expected.resize(8, 0x5555);
+        EXPECT_EQ(destination, expected);
+    }
+}
+
+TEST(PlayAudioTest, GivesTheDescription) {
+    Blocks decoder;
+    EXPECT_EQ(PlayAudio(&decoder), &decoder.info);
+}
+
+} // namespace

@@ -1,0 +1,225 @@
+#include "tests/engine/ScriptedHost.h"
+
+#include <cmath>
+#include <cstdarg>
+#include <cstdio>
+#include <sstream>
+
+#include <sys/times.h>
+
+namespace {
+
+std::atomic<uint32_t> g_ticks{0};
+
+__attribute__((format(printf, 1, 2))) void Note(const char* format, ...) {
+    char line[256];
+    va_list arguments;
+    va_start(arguments, format);
+    vsnprintf(line, sizeof line, format, arguments);
+    va_end(arguments);
+    recorder::Note(line);
+}
+
+UInt32 Parameter(EventRef event, EventParamName name) {
+    UInt32 value = 0xDEADBEEF;
+    GetEventParameter(event, name, 0x55494E54, nullptr, sizeof value, nullptr, &value);
+    return value;
+}
+
+} // namespace
+
+// These two take the place of the system's and the platform's, in the engine too.
+
+extern "C" __attribute__((visibility("default"))) clock_t times(struct tms*) noexcept {
+    return g_ticks;
+}
+
+OSStatus PostEventToQueue(EventQueueRef queue, EventRef event, EventPriority priority) {
+    const bool usual = queue == GetMainEventQueue() && GetEventClass(event) == 5000 &&
+                       GetEventKind(event) == 0x6B696E64 && priority == kEventPriorityStandard;
+    const UInt32 wParam = Parameter(event, 0x5750414D);
+    const UInt32 window = Parameter(event, 0x48574E44);
+    std::string line = wParam == 0 ? "event progress" : wParam == 100 ? "event finished" : "event ?";
+    line += " " + std::to_string(static_cast<int32_t>(Parameter(event, 0x4C50414D)));
+    if (window != 0)
+        line += " for window " + std::to_string(window);
+    recorder::Note(usual ? line : line + " unusual");
+    return noErr;
+}
+
+void SetClock(uint32_t ms) {
+    g_ticks = ms / 10;
+}
+void AdvanceClock(uint32_t ms) {
+    g_ticks += ms / 10;
+}
+
+ScriptedVideo::ScriptedVideo() {
+    info.format = {320, 240, 10.0, 1.0};
+}
+
+double ScriptedVideo::Seek(double seconds, int mode) {
+    Note("seek video %g %d", seconds, mode);
+    return seconds;
+}
+
+VideoImage* ScriptedVideo::GetCurrentImage() {
+    if (images.empty()) {
+        images.resize(stamps.size());
+        for (size_t i = 0; i < stamps.size(); ++i) {
+            images[i].nType = kMediaTypePicture;
+            images[i].nDuration = static_cast<int32_t>(i);
+            images[i].llTime = stamps[i];
+            images[i].llTime2 = stamps[i] + 7;
+        }
+    }
+    if (position >= images.size()) {
+        Note("image none");
+        return nullptr;
+    }
+    Note("image %lld", static_cast<long long>(stamps[position]));
+    if (overwrites) {
+        images[0].llTime = stamps[position];
+        images[0].llTime2 = stamps[position] + 7;
+        return images.data();
+    }
+    return &images[position];
+}
+
+int ScriptedVideo::DecodeNext(int mode) {
+    const bool atEnd = position + 1 >= stamps.size();
+    if (!atEnd || !staysAtLast)
+        ++position;
+    if (overwrites && !atEnd) {
+        images[0].llTime = stamps[position];
+        images[0].llTime2 = stamps[position] + 7;
+    }
+    AdvanceClock(stepMs);
+    if (onNext)
+        onNext(position);
+    const int result = atEnd && announcesEnd ? 0 : mode;
+    Note("next -> %d", result);
+    return result;
+}
+
+ScriptedAudio::ScriptedAudio() {
+    info.format = {1000, 1, 8, 1000, 1.0};
+}
+
+double ScriptedAudio::Seek(double seconds) {
+    Note("seek audio %g", seconds);
+    return seconds;
+}
+
+AudioFrame ScriptedAudio::Block(size_t index) const {
+    static unsigned char samples[1 << 16]; // more than any test's blocks
+    AudioFrame frame{};
+    frame.nType = 42;
+    frame.nSampleRate = info.format.nSampleRate;
+    frame.pData = samples + index % 256;
+    frame.nLength = blockLength;
+    frame.nBufferSize = blockLength + 1;
+    frame.reserved[27] = 200;
+    frame.llTime2 = stamps[index] + 3;
+    frame.llTime = stamps[index];
+    frame.nDuration = static_cast<int32_t>(index);
+    return frame;
+}
+
+AudioFrame* ScriptedAudio::GetNextFrame() {
+    AdvanceClock(stepMs);
+    if (onBlock)
+        onBlock(position);
+    if (position >= stamps.size()) {
+        Note("block none");
+        block = {};
+        return endsEmpty ? &block : nullptr;
+    }
+    block = Block(position++);
+    Note("block %lld", static_cast<long long>(block.llTime));
+    return &block;
+}
+
+std::vector<int64_t> Stamps(int64_t first, int64_t step, size_t count) {
+    std::vector<int64_t> stamps(count);
+    for (size_t i = 0; i < count; ++i)
+        stamps[i] = first + step * static_cast<int64_t>(i);
+    return stamps;
+}
+
+ScriptedHost::ScriptedHost() {
+    recorder::Reset();
+    SetClock(0xFFFFFF00); // so that every longer test crosses the wrap
+}
+
+void ScriptedHost::Create() {
+    handle = MCCreate(hasVideo ? &video : nullptr, hasAudio ? &audio : nullptr);
+    MCSetOutputFile(handle, L"out.mp4");
+}
+
+int ScriptedHost::Start(double begin, double length) {
+    if (!handle)
+        Create();
+    return MCStart(handle, begin, length, window, hasCallback ? Callback : nullptr, this);
+}
+
+std::string ScriptedHost::Convert(double begin, double length) {
+    Start(begin, length);
+    MCWait(handle, MC_INFINITE);
+    return TraceWithoutLog();
+}
+
+unsigned ScriptedHost::Callback(void* context, unsigned kind, unsigned value, uintptr_t info) {
+    return static_cast<ScriptedHost*>(context)->OnCallback(kind, value,
+                                                           reinterpret_cast<const ProgressInfo*>(info));
+}
+
+unsigned ScriptedHost::OnCallback(unsigned kind, unsigned value, const ProgressInfo* info) {
+    if (info && kind == 0)
+        records.push_back(*info);
+    std::string line = (kind == 1 ? "finished " : "progress ") + std::to_string(static_cast<int>(value));
+    char text[64] = " without record";
+    if (info)
+        snprintf(text, sizeof text, " at %g", info->dPosition);
+    line += text;
+    if (info && std::abs(info->dDoneLength - info->dPosition) > 1e-9) {
+        snprintf(text, sizeof text, " done %g", info->dDoneLength);
+        line += text;
+    }
+    if (info && info->pPreviewImage)
+        line += " preview " + std::to_string(info->pPreviewImage->llTime);
+    recorder::Note(line);
+    if (onCallback)
+        onCallback(kind, info);
+    return kind == 0 && ++progressCalls == cancelAt ? 0 : 1;
+}
+
+std::string Trimmed(const std::string& text) {
+    std::string lines;
+    std::istringstream stream(text);
+    for (std::string line; std::getline(stream, line);) {
+        const size_t start = line.find_first_not_of(' ');
+        if (start != std::string::npos)
+            lines += line.substr(start) + "\n";
+    }
+    return lines;
+}
+
+namespace {
+
+std::string Filter(bool logLines) {
+    std::string lines;
+    for (const std::string& line : recorder::Trace())
+        if ((line.rfind("log ", 0) == 0) == logLines)
+            lines += (logLines ? line.substr(4) : line) + "\n";
+    return lines;
+}
+
+} // namespace
+
+std::string LogLines() {
+    return Filter(true);
+}
+std::string TraceWithoutLog() {
+    return Filter(false);
+}

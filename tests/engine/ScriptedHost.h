@@ -1,0 +1,136 @@
+// A host whose decoders play lists, whose clock stands still unless a decoder moves it, and whose every part
+// writes into the recorder's trace: decoder calls, callbacks, events posted to the main queue. The engine is
+// the product's own, behind its exported functions.
+#ifndef MOVIECONV_TESTS_ENGINE_SCRIPTEDHOST_H
+#define MOVIECONV_TESTS_ENGINE_SCRIPTEDHOST_H
+
+#include "api/MovieConv.h"
+#include "tests/recorder/RecordingWriter.h"
+
+#include <atomic>
+#include <functional>
+#include <string>
+#include <vector>
+
+/// Seconds and milliseconds in the 100 ns of time stamps.
+constexpr int64_t kSecond = 10000000;
+constexpr int64_t kMs = 10000;
+
+/// Sets the clock that the engine reads, in milliseconds; steps of 10 count.
+void SetClock(uint32_t ms);
+void AdvanceClock(uint32_t ms);
+
+/// Plays pictures with the given stamps. Notes
+///     seek video SECONDS MODE
+///     image STAMP, or image none
+///     next -> RESULT
+class ScriptedVideo : public VideoDecoder {
+public:
+    ScriptedVideo();
+
+    VideoSourceInfo* GetVideoInfo() override { return opens ? &info : nullptr; }
+    double Seek(double seconds, int mode) override;
+    VideoImage* GetCurrentImage() override;
+    int DecodeNext(int mode) override;
+
+    VideoFormat& Format() { return info.format; }
+
+    /// The record of picture `index`, once a conversion has begun.
+    const VideoImage* Image(size_t index) const { return &images[index]; }
+
+    std::vector<int64_t> stamps;
+    bool opens = true;                  // false: there is no description
+    bool staysAtLast = false;           // goes on handing out the last picture after the end
+    bool announcesEnd = true;           // DecodeNext tells the end; otherwise the picture is missing
+    bool overwrites = false;            // one record for all pictures; otherwise each has its own
+    uint32_t stepMs = 0;                // what the clock advances at each DecodeNext
+    std::function<void(size_t)> onNext; // told the number of pictures done
+
+private:
+    VideoSourceInfo info{};
+    std::vector<VideoImage> images;
+    size_t position = 0;
+};
+
+/// Plays blocks of `blockLength` bytes with the given stamps. Notes
+///     seek audio SECONDS
+///     block STAMP, or block none
+class ScriptedAudio : public AudioDecoder {
+public:
+    /// Sound of 1000 bytes a second: 1000 Hz, one channel, 8 bits.
+    ScriptedAudio();
+
+    AudioSourceInfo* GetAudioInfo() override { return opens ? &info : nullptr; }
+    double Seek(double seconds) override;
+    AudioFrame* GetNextFrame() override;
+
+    AudioFormat& Format() { return info.format; }
+
+    /// Block `index` as it is handed out.
+    AudioFrame Block(size_t index) const;
+
+    std::vector<int64_t> stamps;
+    int32_t blockLength = 50;
+    bool opens = true;
+    bool endsEmpty = false;              // the end is an empty block, not null
+    uint32_t stepMs = 0;                 // what the clock advances at each block
+    std::function<void(size_t)> onBlock; // told the number of blocks done
+
+private:
+    AudioSourceInfo info{};
+    AudioFrame block{};
+    size_t position = 0;
+};
+
+/// Stamps from `first` on, `count` of them, `step` apart.
+std::vector<int64_t> Stamps(int64_t first, int64_t step, size_t count);
+
+/// A converter over scripted decoders. Notes the callbacks:
+///     progress VALUE at POSITION [done LENGTH] [preview STAMP]      "done" where it is not the position
+///     finished OUTCOME at POSITION [done LENGTH], or finished OUTCOME without record
+/// and the events:
+///     event progress VALUE, event finished OUTCOME
+class ScriptedHost {
+public:
+    ScriptedHost();
+    ~ScriptedHost() { MCDestroy(handle); }
+    ScriptedHost(const ScriptedHost&) = delete;
+    ScriptedHost& operator=(const ScriptedHost&) = delete;
+
+    /// Makes the converter over the decoders that are wanted, with the output "out.mp4".
+    void Create();
+
+    /// Creates the converter unless it exists, and starts it with the callback.
+    int Start(double begin = 0.0, double length = 0.0);
+
+    /// Starts, waits for the end and returns the trace without log lines.
+    std::string Convert(double begin = 0.0, double length = 0.0);
+
+    static unsigned Callback(void* context, unsigned kind, unsigned value, uintptr_t info);
+
+    ScriptedVideo video;
+    ScriptedAudio audio;
+    bool hasVideo = true;
+    bool hasAudio = true;
+    bool hasCallback = true;
+    unsigned cancelAt = 0; // number of the progress call, from 1, that returns 0
+    std::function<void(unsigned kind, const ProgressInfo*)> onCallback;
+    OpaqueWindowPtr* window = nullptr;
+    MCHandle handle = nullptr;
+
+    std::vector<ProgressInfo> records; // of the progress calls
+
+private:
+    unsigned OnCallback(unsigned kind, unsigned value, const ProgressInfo* info);
+
+    unsigned progressCalls = 0;
+};
+
+/// A text without the spaces that indent its lines and without empty lines.
+std::string Trimmed(const std::string& text);
+
+/// The log lines of the trace, or everything else, a line each.
+std::string LogLines();
+std::string TraceWithoutLog();
+
+#endif
