@@ -24,9 +24,8 @@ double LongestDuration(VideoDecoder* video, AudioDecoder* audio) {
     const VideoFormat* pictures = SourceFormat(video);
     if (pictures && pictures->dFrameRate > 0.0001)
         duration = pictures->dDuration;
-    if (const AudioFormat* sound = SourceFormat(audio))
-        duration = std::max(sound->dDuration, duration);
-    return duration;
+    const AudioFormat* sound = SourceFormat(audio);
+    return sound && sound->dDuration > duration ? sound->dDuration : duration;
 }
 
 void LogDiskSpace(long long estimate, long long freeSpace, const wchar_t* outputFile) {

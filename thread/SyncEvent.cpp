@@ -3,6 +3,8 @@
 #include "thread/Clock.h"
 #include "thread/SingleLock.h"
 
+#include <new>
+
 #include <unistd.h>
 
 SyncEvent::SyncEvent(bool manualReset, int32_t initialState)
@@ -40,7 +42,7 @@ unsigned SyncEvent::Wait(unsigned timeoutMs) {
 
 SyncEvent* SyncCreateEvent(void* /*attributes*/, unsigned manualReset, unsigned initialState,
                            const char* /*name*/) {
-    return new SyncEvent(manualReset != 0, static_cast<int32_t>(initialState));
+    return new (std::nothrow) SyncEvent(manualReset != 0, static_cast<int32_t>(initialState));
 }
 
 void SyncCloseEvent(SyncEvent* event) {

@@ -33,8 +33,8 @@ private:
 
 #pragma GCC visibility push(default)
 
-/// A new event on the heap, owned by the caller, to be given to SyncCloseEvent. `attributes` and `name` are
-/// not used.
+/// A new event on the heap, owned by the caller, to be given to SyncCloseEvent; null without memory.
+/// `attributes` and `name` are not used.
 SyncEvent* SyncCreateEvent(void* attributes, unsigned manualReset, unsigned initialState, const char* name);
 
 /// Frees an event. Null does nothing.

@@ -56,8 +56,8 @@ protected:
             EXPECT_EQ(frame->pData, decoder.data + piece.offset);
             EXPECT_EQ(frame->nLength, piece.length);
             EXPECT_EQ(frame->nBufferSize, piece.length);
-            EXPECT_EQ(frame->llTime, piece.time);
-            EXPECT_EQ(frame->llTime2, piece.time);
+            EXPECT_EQ(+frame->llTime, piece.time);
+            EXPECT_EQ(+frame->llTime2, piece.time);
             EXPECT_EQ(frame->nDuration, piece.duration);
             EXPECT_EQ(frame->nType, 5);
             EXPECT_EQ(frame->reserved[3], 77);

@@ -74,7 +74,7 @@ TEST_F(ParamTest, ZerosAreCompletedAndLoggedAsTheyCame) {
     const EncodeParam set = Set(param);
     EXPECT_EQ(set.nWidth, 640);
     EXPECT_EQ(set.nHeight, 480);
-    EXPECT_EQ(set.dFrameRate, 29.97);
+    EXPECT_EQ(+set.dFrameRate, 29.97);
     EXPECT_EQ(set.nVideoBitrate, 512000);
     EXPECT_EQ(set.nSampleRate, 44100);
     EXPECT_EQ(set.nChannels, 2);
@@ -120,16 +120,16 @@ TEST_F(ParamTest, FrameRatesAbove200AreNotBelieved) {
     host.Create();
     EncodeParam param = Get();
     param.dFrameRate = 200.0;
-    EXPECT_EQ(Set(param).dFrameRate, 200.0);
+    EXPECT_EQ(+Set(param).dFrameRate, 200.0);
     param.dFrameRate = 200.5;
-    EXPECT_EQ(Set(param).dFrameRate, 30.0);
+    EXPECT_EQ(+Set(param).dFrameRate, 30.0);
     param.dFrameRate = -1.0;
     host.video.Format().dFrameRate = 1000.0;
-    EXPECT_EQ(Set(param).dFrameRate, 30.0);
+    EXPECT_EQ(+Set(param).dFrameRate, 30.0);
     host.video.opens = false;
     param.dFrameRate = 500.0;
     param.nVideoBitrate = 0;
-    EXPECT_EQ(Set(param).dFrameRate, 30.0);
+    EXPECT_EQ(+Set(param).dFrameRate, 30.0);
     EXPECT_EQ(Get().nVideoBitrate, 0);
 }
 

@@ -141,7 +141,7 @@ TEST(RecordTest, ProgressWithoutALengthIsZero) {
     host.audio.stamps = {0};
     host.Convert(1.0); // the source lasts 1.0
     ASSERT_EQ(host.records.size(), 4U);
-    EXPECT_EQ(host.records[0].dTotalLength, 0.0);
+    EXPECT_EQ(+host.records[0].dTotalLength, 0.0);
     EXPECT_EQ(host.records[0].nProgress, 0);
     EXPECT_EQ(host.records[3].nProgress, 10000);
 }
@@ -221,9 +221,9 @@ TEST(RecordTest, ClipsOfPicturesMoveBothStamps) {
     host.Convert();
     const auto pictures = recorder::Pictures();
     ASSERT_EQ(pictures.size(), 3U);
-    EXPECT_EQ(pictures[0].record.llTime2, 1007);
-    EXPECT_EQ(pictures[1].record.llTime2, 1000);
-    EXPECT_EQ(pictures[2].record.llTime2, 3000);
+    EXPECT_EQ(+pictures[0].record.llTime2, 1007);
+    EXPECT_EQ(+pictures[1].record.llTime2, 1000);
+    EXPECT_EQ(+pictures[2].record.llTime2, 3000);
     EXPECT_EQ(pictures[2].record.nDuration, 2);
 }
 
@@ -306,8 +306,8 @@ TEST(RecordTest, SoundOfNoRateTakesNoTime) {
     host.audio.Format().nBytesPerSecond = 0;
     host.Convert();
     for (const auto& sound : recorder::Sounds())
-        EXPECT_EQ(sound.record.llTime, 0);
-    EXPECT_EQ(host.records.back().dPosition, 0.0);
+        EXPECT_EQ(+sound.record.llTime, 0);
+    EXPECT_EQ(+host.records.back().dPosition, 0.0);
 }
 
 } // namespace

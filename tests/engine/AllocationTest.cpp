@@ -1,0 +1,133 @@
+// What the engine allocates: nothing in an iteration, and nothing that it cannot do without.
+#include "api/MovieConv.h"
+#include "tests/engine/IdleParts.h"
+
+#include <gtest/gtest.h>
+
+#include <atomic>
+#include <cstdlib>
+#include <new>
+
+namespace {
+
+std::atomic<int64_t> g_allocations{0};
+std::atomic<int64_t> g_failing{0}; // number of the allocation from now on that fails; 0 for none
+
+void* Allocate(size_t size) {
+    ++g_allocations;
+    if (g_failing > 0 && --g_failing == 0)
+        return nullptr;
+    return std::malloc(size != 0 ? size : 1);
+}
+
+} // namespace
+
+// In place of the library's own, in the engine too.
+void* operator new(size_t size) {
+    if (void* memory = Allocate(size))
+        return memory;
+    throw std::bad_alloc();
+}
+void* operator new[](size_t size) {
+    return operator new(size);
+}
+void* operator new(size_t size, const std::nothrow_t&) noexcept {
+    return Allocate(size);
+}
+void* operator new[](size_t size, const std::nothrow_t&) noexcept {
+    return Allocate(size);
+}
+void operator delete(void* memory) noexcept {
+    std::free(memory);
+}
+void operator delete[](void* memory) noexcept {
+    std::free(memory);
+}
+void operator delete(void* memory, size_t) noexcept {
+    std::free(memory);
+}
+void operator delete[](void* memory, size_t) noexcept {
+    std::free(memory);
+}
+
+namespace {
+
+struct News {
+    int progress = 0;
+    int outcome = -1;
+};
+
+unsigned Callback(void* context, unsigned kind, unsigned value, uintptr_t) {
+    auto* news = static_cast<News*>(context);
+    if (kind == 0)
+        ++news->progress;
+    else
+        news->outcome = static_cast<int>(value);
+    return 1;
+}
+
+struct Source {
+    const char* name;
+    int64_t pictures, blocks; // a thousandth of them in the short run
+};
+
+class AllocationTest : public testing::TestWithParam<Source> {};
+
+/// Allocations of one conversion.
+int64_t Convert(int64_t pictures, int64_t blocks, News& news) {
+    IdleVideo video(pictures);
+    IdleAudio audio(blocks);
+    MCHandle handle = MCCreate(pictures > 0 ? &video : nullptr, blocks > 0 ? &audio : nullptr);
+    const int64_t before = g_allocations;
+    MCStart(handle, 0.0, 0.0, nullptr, Callback, &news);
+    MCWait(handle, MC_INFINITE);
+    const int64_t count = g_allocations - before;
+    MCDestroy(handle);
+    return count;
+}
+
+TEST_P(AllocationTest, DoesNotDependOnTheLength) {
+    News shortNews;
+    News longNews;
+    const int64_t few = Convert(GetParam().pictures / 1000, GetParam().blocks / 1000, shortNews);
+    const int64_t many = Convert(GetParam().pictures, GetParam().blocks, longNews);
+    EXPECT_EQ(few, many);
+    EXPECT_EQ(longNews.outcome, kOutcomeCompleted);
+    EXPECT_GE(longNews.progress, shortNews.progress);
+}
+
+INSTANTIATE_TEST_SUITE_P(Loops, AllocationTest,
+                         testing::Values(Source{"AudioVideo", 50000, 100000},
+                                         Source{"PicturesEndFirst", 20000, 100000},
+                                         Source{"SoundEndsFirst", 50000, 20000}, Source{"Audio", 0, 100000},
+                                         Source{"Video", 50000, 0}),
+                         [](const auto& info) { return info.param.name; });
+
+// Every allocation fails once: the converter is not made, or the name not set, or the conversion does not
+// come about, and never more than that. The first run without a failure ends the loop.
+TEST(AllocationFailureTest, IsReported) {
+    for (int64_t number = 1;; ++number) {
+        IdleVideo video(10);
+        IdleAudio audio(1);
+        News news;
+        g_failing = number;
+        MCHandle handle = MCCreate(&video, &audio);
+        const bool named =
+            handle && MCSetOutputFile(handle, L"/a/name/that/does/not/fit/into/the/object/itself.mp4") == 1;
+        if (named) {
+            MCSetSplitParam(handle, 1, 1000);
+            EXPECT_EQ(MCStart(handle, 0.0, 0.0, nullptr, Callback, &news), 0);
+            EXPECT_EQ(MCWait(handle, MC_INFINITE), 0);
+        }
+        const bool failed = g_failing.exchange(0) <= 0;
+        MCDestroy(handle);
+        if (!failed) {
+            EXPECT_EQ(news.outcome, kOutcomeCompleted);
+            EXPECT_GT(number, 7) << "converter, events, name, thread, clip name, list, silence";
+            return;
+        }
+        EXPECT_TRUE(news.outcome == -1 || news.outcome == kOutcomeFailed) << number;
+    }
+}
+
+} // namespace
