@@ -22,9 +22,13 @@ struct OpaqueCFBundle {
 CFBundleRef CFBundleGetMainBundle() {
     // Never freed: workers may still log while the process ends.
     static OpaqueCFBundle* const bundle = []() -> OpaqueCFBundle* {
-        std::error_code error;
-        const auto executable = std::filesystem::read_symlink("/proc/self/exe", error);
-        return error ? nullptr : new OpaqueCFBundle{BundleUrl(executable.native())};
+        try {
+            std::error_code error;
+            const auto executable = std::filesystem::read_symlink("/proc/self/exe", error);
+            return error ? nullptr : new OpaqueCFBundle{BundleUrl(executable.native())};
+        } catch (const std::bad_alloc&) {
+            return nullptr;
+        }
     }();
     return bundle;
 }

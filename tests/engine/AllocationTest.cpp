@@ -1,54 +1,9 @@
 // What the engine allocates: nothing in an iteration, and nothing that it cannot do without.
 #include "api/MovieConv.h"
+#include "tests/engine/CountingAllocator.h"
 #include "tests/engine/IdleParts.h"
 
 #include <gtest/gtest.h>
-
-#include <atomic>
-#include <cstdlib>
-#include <new>
-
-namespace {
-
-std::atomic<int64_t> g_allocations{0};
-std::atomic<int64_t> g_failing{0}; // number of the allocation from now on that fails; 0 for none
-
-void* Allocate(size_t size) {
-    ++g_allocations;
-    if (g_failing > 0 && --g_failing == 0)
-        return nullptr;
-    return std::malloc(size != 0 ? size : 1);
-}
-
-} // namespace
-
-// In place of the library's own, in the engine too.
-void* operator new(size_t size) {
-    if (void* memory = Allocate(size))
-        return memory;
-    throw std::bad_alloc();
-}
-void* operator new[](size_t size) {
-    return operator new(size);
-}
-void* operator new(size_t size, const std::nothrow_t&) noexcept {
-    return Allocate(size);
-}
-void* operator new[](size_t size, const std::nothrow_t&) noexcept {
-    return Allocate(size);
-}
-void operator delete(void* memory) noexcept {
-    std::free(memory);
-}
-void operator delete[](void* memory) noexcept {
-    std::free(memory);
-}
-void operator delete(void* memory, size_t) noexcept {
-    std::free(memory);
-}
-void operator delete[](void* memory, size_t) noexcept {
-    std::free(memory);
-}
 
 namespace {
 
@@ -78,10 +33,10 @@ int64_t Convert(int64_t pictures, int64_t blocks, News& news) {
     IdleVideo video(pictures);
     IdleAudio audio(blocks);
     MCHandle handle = MCCreate(pictures > 0 ? &video : nullptr, blocks > 0 ? &audio : nullptr);
-    const int64_t before = g_allocations;
+    const int64_t before = Allocations();
     MCStart(handle, 0.0, 0.0, nullptr, Callback, &news);
     MCWait(handle, MC_INFINITE);
-    const int64_t count = g_allocations - before;
+    const int64_t count = Allocations() - before;
     MCDestroy(handle);
     return count;
 }
@@ -106,11 +61,13 @@ INSTANTIATE_TEST_SUITE_P(Loops, AllocationTest,
 // Every allocation fails once: the converter is not made, or the name not set, or the conversion does not
 // come about, and never more than that. The first run without a failure ends the loop.
 TEST(AllocationFailureTest, IsReported) {
+    News warmUp; // what the log sink is looked for with is not counted: no conversion fails for a lost line
+    Convert(1, 1, warmUp);
     for (int64_t number = 1;; ++number) {
         IdleVideo video(10);
         IdleAudio audio(1);
         News news;
-        g_failing = number;
+        FailAllocation(number);
         MCHandle handle = MCCreate(&video, &audio);
         const bool named =
             handle && MCSetOutputFile(handle, L"/a/name/that/does/not/fit/into/the/object/itself.mp4") == 1;
@@ -119,7 +76,7 @@ TEST(AllocationFailureTest, IsReported) {
             EXPECT_EQ(MCStart(handle, 0.0, 0.0, nullptr, Callback, &news), 0);
             EXPECT_EQ(MCWait(handle, MC_INFINITE), 0);
         }
-        const bool failed = g_failing.exchange(0) <= 0;
+        const bool failed = FailAllocation(0);
         MCDestroy(handle);
         if (!failed) {
             EXPECT_EQ(news.outcome, kOutcomeCompleted);
