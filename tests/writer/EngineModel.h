@@ -2,6 +2,7 @@
 #ifndef MOVIECONV_TESTS_WRITER_ENGINEMODEL_H
 #define MOVIECONV_TESTS_WRITER_ENGINEMODEL_H
 
+#include <cmath>
 #include <cstdint>
 #include <vector>
 
@@ -17,7 +18,7 @@ struct ModelSource {
     int64_t stampRounding = 1; ///< Stamps of the source are rounded to this.
     int splitMilliseconds = 0; ///< 0: one file.
 
-    int64_t PictureLength() const { return static_cast<int64_t>(1e7 / fps + 0.5); }
+    int64_t PictureLength() const { return std::llround(1e7 / fps); }
 };
 
 /// One call to the writer.

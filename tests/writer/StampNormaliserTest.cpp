@@ -94,9 +94,9 @@ void CheckAllClips(const ModelSource& source, const std::string& what) {
 struct Case {
     const char* name;
     double fps;
-    int blockSamples;
     int64_t offset;
     double soundSeconds;
+    int blockSamples;
     int split;
 };
 
@@ -115,19 +115,19 @@ TEST_P(KnownCases, KeepPicturesAndSoundTogether) {
 }
 
 constexpr Case kCases[] = {
-    {"OneFile", 25, 512, 0, 10, 0},
-    {"ShortBlocks", 25, 441, 0, 10, 2000},
-    {"AacBlocks", 25, 1024, 0, 10, 2000},
-    {"BlocksLongerThanPictures", 25, 4410, 0, 10, 2000},
-    {"BlocksOfHalfASecond", 25, 22050, 0, 10, 2000},
-    {"SixtyPicturesASecond", 60, 1024, 0, 10, 2000},
-    {"SoundLate", 25, 1024, 100 * kMillisecond, 9.9, 2000},
-    {"SoundEarly", 25, 1024, -100 * kMillisecond, 10.1, 2000},
-    {"SoundEndsEarly", 25, 1024, 0, 3.3, 2000},
-    {"SoundVeryLate", 25, 1024, 5 * kSecond, 5, 2000},
-    {"SoundVeryLateInOneFile", 25, 1024, 5 * kSecond, 5, 0},
-    {"SoundVeryEarly", 25, 1024, -3 * kSecond, 13, 2000},
-    {"ClipAPicture", 25, 256, 0, 10, 1},
+    {"OneFile", 25, 0, 10, 512, 0},
+    {"ShortBlocks", 25, 0, 10, 441, 2000},
+    {"AacBlocks", 25, 0, 10, 1024, 2000},
+    {"BlocksLongerThanPictures", 25, 0, 10, 4410, 2000},
+    {"BlocksOfHalfASecond", 25, 0, 10, 22050, 2000},
+    {"SixtyPicturesASecond", 60, 0, 10, 1024, 2000},
+    {"SoundLate", 25, 100 * kMillisecond, 9.9, 1024, 2000},
+    {"SoundEarly", 25, -100 * kMillisecond, 10.1, 1024, 2000},
+    {"SoundEndsEarly", 25, 0, 3.3, 1024, 2000},
+    {"SoundVeryLate", 25, 5 * kSecond, 5, 1024, 2000},
+    {"SoundVeryLateInOneFile", 25, 5 * kSecond, 5, 1024, 0},
+    {"SoundVeryEarly", 25, -3 * kSecond, 13, 1024, 2000},
+    {"ClipAPicture", 25, 0, 10, 256, 1},
 };
 
 INSTANTIATE_TEST_SUITE_P(StampNormaliser, KnownCases, testing::ValuesIn(kCases),

@@ -121,7 +121,7 @@ void* TestMovie::Create(const std::string& path) const {
 void TestMovie::WriteAll(void* file) const {
     TestPicture picture(width, height, pitchExtra);
     TestSound sound(sampleRate, channels, bits);
-    const auto samples = static_cast<int64_t>(soundSeconds * sampleRate + 0.5);
+    const int64_t samples = std::llround(soundSeconds * sampleRate);
     int64_t written = 0;
     const auto write_sound = [&](int64_t until) {
         while (hasAudio && written < samples && written * kSecond / sampleRate <= until) {
