@@ -96,8 +96,8 @@ private:
         const int64_t gap = picture - audioSource_;
         for (int64_t covered = 0; covered < gap;) {
             const int64_t step = std::min<int64_t>(gap - covered, 400'000);
-            const auto bytes = static_cast<int64_t>(
-                static_cast<double>(step) / 1e7 * static_cast<double>(bytesPerSecond_) + 0.5);
+            const int64_t bytes =
+                std::llround(static_cast<double>(step) / 1e7 * static_cast<double>(bytesPerSecond_));
             clips_.back().push_back({false, true, audioOut_ + covered, 0, bytes});
             audioBytes_ += bytes;
             audioSource_ += step;
