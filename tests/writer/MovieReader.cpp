@@ -4,6 +4,7 @@ extern "C" {
 #include <libavutil/imgutils.h>
 }
 
+#include <cstring>
 #include <functional>
 #include <map>
 
@@ -23,6 +24,13 @@ void TakePicture(const AVFrame& frame, AVRational unit, ReadMovie& movie) {
     movie.pictures.push_back(std::move(picture));
 }
 
+template <class Sample>
+Sample Load(const uint8_t* data, size_t index) {
+    Sample sample;
+    std::memcpy(&sample, data + index * sizeof(Sample), sizeof(Sample));
+    return sample;
+}
+
 float SampleAt(const AVFrame& frame, int index) {
     const int stride = av_sample_fmt_is_planar(static_cast<AVSampleFormat>(frame.format)) != 0
                            ? 1
@@ -33,11 +41,11 @@ float SampleAt(const AVFrame& frame, int index) {
     case AV_SAMPLE_FMT_U8:
         return static_cast<float>(data[at] - 128) / 128.0F;
     case AV_SAMPLE_FMT_S16:
-        return static_cast<float>(reinterpret_cast<const int16_t*>(data)[at]) / 32768.0F;
+        return static_cast<float>(Load<int16_t>(data, at)) / 32768.0F;
     case AV_SAMPLE_FMT_S32:
-        return static_cast<float>(reinterpret_cast<const int32_t*>(data)[at]) / 2147483648.0F;
+        return static_cast<float>(Load<int32_t>(data, at)) / 2147483648.0F;
     case AV_SAMPLE_FMT_FLT:
-        return reinterpret_cast<const float*>(data)[at];
+        return Load<float>(data, at);
     default:
         return 0;
     }
