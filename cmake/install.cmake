@@ -36,9 +36,7 @@ target_sources(movieconv PUBLIC FILE_SET HEADERS BASE_DIRS ${PROJECT_SOURCE_DIR}
 install(TARGETS movieconv platform orvex quennet EXPORT MovieConvTargets
   LIBRARY DESTINATION ${home_dir}
   FILE_SET HEADERS DESTINATION ${header_dir})
-if(TARGET movieconv_host)
-  install(TARGETS movieconv_host RUNTIME DESTINATION ${home_dir})
-endif()
+install(TARGETS movieconv_host RUNTIME DESTINATION ${home_dir})
 
 # install_link(FOLDER NAME TARGET): a link NAME in FOLDER to TARGET, both of the installed tree.
 function(install_link folder name target)
