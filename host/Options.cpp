@@ -34,8 +34,7 @@ CLI::Option* AddChoice(CLI::App& app, const std::string& name, Value& target,
 void AddEncoding(CLI::App& app, Options& options) {
     const std::string group = "Format and codecs";
     app.add_option("-f,--format", options.format,
-                   "File format: a code or an extension of --list-formats; by default\n"
-                   "the output's extension tells")
+                   "File format, by code or extension; by default the\noutput's extension tells")
         ->type_name("NAME")
         ->group(group);
     app.add_option("--video-codec", options.videoCodec, "Four-character code of the picture codec")
@@ -67,7 +66,7 @@ void AddPictures(CLI::App& app, Options& options) {
         ->type_name("RATE")
         ->group(group);
     AddParsed(app, "--video-max-rate", ParseRate, options.videoMaxRate, "a bit rate such as 512k or 1.5M",
-              "Upper bit rate: the rate becomes a target that may vary")
+              "Upper bit rate: the rate becomes a target")
         ->type_name("RATE")
         ->group(group);
 }
@@ -75,11 +74,11 @@ void AddPictures(CLI::App& app, Options& options) {
 void AddSound(CLI::App& app, Options& options) {
     const std::string group = "Sound";
     app.add_option("--channels", options.channels, "Channels; by default the source's")
-        ->check(CLI::Range(1, 8))
+        ->check(CLI::Range(1, 8).description(""))
         ->type_name("N")
         ->group(group);
     app.add_option("--sample-rate", options.sampleRate, "Samples per second; by default the source's")
-        ->check(CLI::Range(4000, 384000))
+        ->check(CLI::Range(4000, 384000).description(""))
         ->type_name("HZ")
         ->group(group);
     AddParsed(app, "--audio-rate", ParseRate, options.audioRate, "a bit rate such as 128k",
@@ -87,7 +86,7 @@ void AddSound(CLI::App& app, Options& options) {
         ->type_name("RATE")
         ->group(group);
     AddParsed(app, "--audio-max-rate", ParseRate, options.audioMaxRate, "a bit rate such as 128k",
-              "Upper bit rate: the rate becomes a target that may vary")
+              "Upper bit rate: the rate becomes a target")
         ->type_name("RATE")
         ->group(group);
 }
@@ -109,15 +108,19 @@ void AddRange(CLI::App& app, Options& options) {
 
 void AddOutput(CLI::App& app, Options& options) {
     const std::string group = "Output";
-    app.add_flag("-y,--overwrite,!--no-overwrite", options.overwrite,
-                 "Replace an existing output; by default it is refused")
+    app.add_flag("-y,--overwrite", options.overwrite, "Replace an existing output; by default it is refused")
         ->group(group);
     AddChoice<OnFull>(app, "--on-full", options.onFull, {{"stop", OnFull::kStop}, {"wait", OnFull::kWait}},
                       "On a full disk: stop (default), or wait until there is\nroom again")
         ->type_name("stop|wait")
         ->group(group);
-    app.add_flag("--keep-partial,!--no-keep-partial", options.keepPartial,
-                 "Keep the playable unfinished file after a failure\n(default)")
+    app.add_flag_callback(
+           "--keep-partial", [&] { options.keepPartial = true; },
+           "After a failure keep the unfinished file, which\nplays (default)")
+        ->group(group);
+    app.add_flag_callback(
+           "--no-keep-partial", [&] { options.keepPartial = false; },
+           "After a failure remove the unfinished file")
         ->group(group);
     app.add_option("--preview", options.preview, "Keep this PNG file showing the picture just written")
         ->type_name("FILE")
@@ -188,9 +191,9 @@ std::optional<Options> ParseOptions(int argc, char** argv) {
                "Exit codes: 0 done, 1 internal, 2 usage, 3 cannot read the source, 4 cannot write\n"
                "the output, 5 no space, 6 stopped. See movieconv(1).");
     app.set_help_flag("-h,--help", "Print this help")->group("Instead of converting");
-    app.set_version_flag("--version", "movieconv " MOVIECONV_VERSION)->group("Instead of converting");
-    app.add_option("INPUT", options.input, "The movie to convert: any file that FFmpeg's libraries read")
-        ->type_name("");
+    app.set_version_flag("--version", "movieconv " MOVIECONV_VERSION, "Print the version")
+        ->group("Instead of converting");
+    app.add_option("INPUT", options.input, "The movie to convert, any that FFmpeg can read")->type_name("");
     app.add_option("OUTPUT", options.output, "The file to make")->type_name("");
     AddRange(app, options);
     AddEncoding(app, options);
