@@ -186,10 +186,10 @@ std::optional<Options> ParseOptions(int argc, char** argv) {
                  "movieconv"};
     app.formatter(std::make_shared<HelpFormatter>());
     app.get_formatter()->column_width(26);
-    app.footer("A name that begins with a dash goes behind \"--\". While converting, space or p pauses\n"
-               "and resumes, q or Ctrl-C stops and keeps what is done as a playable file.\n"
-               "Exit codes: 0 done, 1 internal, 2 usage, 3 cannot read the source, 4 cannot write\n"
-               "the output, 5 no space, 6 stopped. See movieconv(1).");
+    app.footer("A name that begins with a dash goes behind \"--\". While converting, space or p\n"
+               "pauses and resumes, q or Ctrl-C stops and keeps what is done as a playable file.\n"
+               "Exit codes: 0 done, 1 internal, 2 usage, 3 cannot read the source, 4 cannot\n"
+               "write the output, 5 no space, 6 stopped. See movieconv(1).");
     app.set_help_flag("-h,--help", "Print this help")->group("Instead of converting");
     app.set_version_flag("--version", "movieconv " MOVIECONV_VERSION, "Print the version")
         ->group("Instead of converting");

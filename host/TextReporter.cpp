@@ -77,7 +77,10 @@ void LineReporter::Start(const StartReport& report) {
 }
 
 void LineReporter::Progress(const ProgressReport& report, bool milestone) {
-    if (!milestone && report.worked < nextAt_) {
+    // Between clips the phase changes back and forth, which the line of the clip tells well enough.
+    const bool worthALine = milestone && report.phase != Phase::kConverting &&
+                            (report.phase != Phase::kFinishing || report.clip == 0);
+    if (!worthALine && report.worked < nextAt_) {
         return;
     }
     nextAt_ = report.worked + kLineSeconds;
