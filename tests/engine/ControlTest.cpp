@@ -153,6 +153,24 @@ TEST(StartTest, CallbackMayAbort) {
         << trace;
 }
 
+// A stop is noticed before the end, when both come in one iteration.
+TEST(StartTest, StopComesBeforeTheEnd) {
+    ScriptedHost host;
+    host.video.stamps = Stamps(0, kSecond / 10, 2);
+    host.audio.stamps = {0};
+    host.video.onNext = [&](size_t done) {
+        if (done == 2)
+            MCAbort(host.handle);
+    };
+    EXPECT_NE(host.Convert().find("event finished 1\n"), std::string::npos);
+    recorder::Reset();
+    ScriptedHost limited;
+    limited.video.stamps = Stamps(0, kSecond / 10, 3);
+    limited.audio.stamps = Stamps(0, kSecond / 20, 6);
+    limited.video.onNext = [&](size_t) { MCAbort(limited.handle); };
+    EXPECT_NE(limited.Convert(0.0, 0.01).find("event finished 1\n"), std::string::npos);
+}
+
 struct StartCase {
     double begin;
     double length;

@@ -52,6 +52,17 @@ TEST(PaceTest, AudioVideoEstimates) {
                     {{33, 19800, 400, 0.5}, {34, 20000, 0, 0.5}}); // picture 99: (100 - 98) at 200 for 1
 }
 
+// An estimate made with the very first pictures counts five of them.
+TEST(PaceTest, FirstAudioVideoEstimateIsCautious) {
+    ScriptedHost host;
+    host.video.stamps = Stamps(0, kSecond / 10, 100);
+    host.video.stepMs = 1000;
+    host.video.Format().dDuration = 10.0;
+    host.audio.stamps = {0};
+    host.Convert();
+    ExpectEstimates(host, {{0, 1000, 20000, 0.5}}); // 100 pictures at 1000 ms for 5
+}
+
 TEST(PaceTest, AudioVideoIntervalGrowsWithTheLength) {
     // pictures, then the numbers of the first, second and third picture that are told
     const int cases[][4] = {{10000, 1, 4, 7},    {22499, 1, 4, 7},    {30000, 1, 5, 9},
