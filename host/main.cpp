@@ -11,6 +11,7 @@
 #include <cstdio>
 #include <exception>
 #include <fmt/format.h>
+#include <malloc.h>
 
 namespace host {
 namespace {
@@ -73,6 +74,7 @@ int Main(int argc, char** argv) {
 } // namespace host
 
 int main(int argc, char** argv) {
+    mallopt(M_ARENA_MAX, 2); // a heap for each of the dozen threads costs 15 MB and saves no time
     try {
         return host::Main(argc, argv);
     } catch (const host::Failure& failure) {

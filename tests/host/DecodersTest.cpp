@@ -1,114 +1,20 @@
 // The decoders against real movies, whole, damaged and odd, called as the engine calls them.
 #include "host/Movie.h"
+#include "tests/host/Inspect.h"
 #include "tests/host/TestMovies.h"
 
 #include <gtest/gtest.h>
 
 #include <cmath>
-#include <cstring>
 #include <filesystem>
 #include <fstream>
 
 namespace {
 
 using namespace test_movies;
+using namespace inspect;
 using host::Movie;
 using Args = std::vector<std::string>;
-
-struct SeenPicture {
-    double time;
-    double duration;
-    int luma; // mean of the plane
-    int width;
-    int height;
-};
-
-struct Seen {
-    std::vector<SeenPicture> pictures;
-    std::vector<int16_t> sound; // first channel
-    double soundBegin = 0;
-    int64_t largestBlock = 0; // samples
-    bool soundContinuous = true;
-};
-
-int MeanLuma(const VideoImage& image) {
-    int64_t sum = 0;
-    for (int y = 0; y < image.nHeight; ++y) {
-        for (int x = 0; x < image.nWidth; ++x) {
-            sum += image.pY[static_cast<ptrdiff_t>(y) * image.nPitchY + x];
-        }
-    }
-    return static_cast<int>(std::lround(static_cast<double>(sum) / image.nWidth / image.nHeight));
-}
-
-void TakeSound(AudioDecoder& decoder, Seen& seen) {
-    int64_t samples = 0;
-    while (const AudioFrame* block = decoder.GetNextFrame()) {
-        if (block->nLength == 0) {
-            break;
-        }
-        const int sampleBytes = block->nBitsPerSample / 8;
-        const int count = block->nLength / sampleBytes / block->nChannels;
-        if (samples == 0) {
-            seen.soundBegin = static_cast<double>(block->llTime) / 1e7;
-        }
-        const double due = seen.soundBegin + static_cast<double>(samples) / block->nSampleRate;
-        seen.soundContinuous =
-            seen.soundContinuous && std::abs(static_cast<double>(block->llTime) / 1e7 - due) < 1e-6;
-        seen.largestBlock = std::max<int64_t>(seen.largestBlock, count);
-        for (int i = 0; i < count; ++i) {
-            int16_t value = 0;
-            const int top = sampleBytes - 2; // the upper 16 bits of a wider sample
-            std::memcpy(&value,
-                        block->pData + static_cast<ptrdiff_t>(i) * block->nChannels * sampleBytes + top, 2);
-            seen.sound.push_back(value);
-        }
-        samples += count;
-    }
-}
-
-/// Everything from `begin` on, pictures first: the decoders must not depend on an even interleaving of the
-/// calls.
-Seen TakeAll(Movie& movie, double begin = 0) {
-    Seen seen;
-    VideoDecoder* pictures = movie.Pictures();
-    AudioDecoder* sound = movie.Sound();
-    if (begin > 0 && pictures != nullptr) {
-        pictures->Seek(begin, 1);
-    }
-    if (begin > 0 && sound != nullptr) {
-        sound->Seek(begin);
-    }
-    if (pictures != nullptr) {
-        for (const VideoImage* image = pictures->GetCurrentImage(); image != nullptr;
-             image = pictures->GetCurrentImage()) {
-            seen.pictures.push_back({static_cast<double>(image->llTime) / 1e7, image->nDuration / 1e7,
-                                     MeanLuma(*image), image->nWidth, image->nHeight});
-            if (pictures->DecodeNext(1) < 1) {
-                break;
-            }
-        }
-    }
-    if (sound != nullptr) {
-        TakeSound(*sound, seen);
-    }
-    return seen;
-}
-
-/// Times at which the sound becomes loud after at least 0.3 s of quiet.
-std::vector<double> Beginnings(const Seen& seen, int rate) {
-    std::vector<double> times;
-    int64_t lastLoud = -rate;
-    for (size_t i = 0; i < seen.sound.size(); ++i) {
-        if (std::abs(seen.sound[i]) > 3000) {
-            if (static_cast<int64_t>(i) - lastLoud > rate * 3 / 10) {
-                times.push_back(seen.soundBegin + static_cast<double>(i) / rate);
-            }
-            lastLoud = static_cast<int64_t>(i);
-        }
-    }
-    return times;
-}
 
 Args H264Aac() {
     return {"-c:v", "libx264", "-preset", "veryfast", "-bf", "2", "-g", "30", "-c:a", "aac"};

@@ -56,7 +56,7 @@ std::vector<std::string> CountedPictures(double seconds, const std::string& rate
                     rate, seconds, kCountedLumas)};
 }
 
-std::vector<std::string> Flashes(double seconds) {
+std::vector<std::string> FlashPictures(double seconds) {
     return {"-f", "lavfi", "-i",
             fmt::format("color=black:s=160x120:r=25:d={},format=yuv420p,"
                         "drawbox=c=white:t=fill:enable='lt(mod(t,1),0.079)'",

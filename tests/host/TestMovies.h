@@ -17,7 +17,7 @@ std::string Make(const std::string& name, const std::vector<std::string>& argume
 /// ffmpeg arguments for pictures of 160 x 120 whose brightness counts them: picture n has luma LumaOf(n).
 std::vector<std::string> CountedPictures(double seconds, const std::string& rate = "25");
 /// ffmpeg arguments for white flashes of 80 ms at every whole second.
-std::vector<std::string> Flashes(double seconds);
+std::vector<std::string> FlashPictures(double seconds);
 /// ffmpeg arguments for beeps of 80 ms at every whole second.
 std::vector<std::string> Beeps(double seconds);
 

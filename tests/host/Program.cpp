@@ -1,0 +1,130 @@
+#include "tests/host/Program.h"
+
+#include <csignal>
+#include <cstdio>
+#include <cstdlib>
+#include <fcntl.h>
+#include <fstream>
+#include <iterator>
+#include <pty.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+namespace program {
+namespace {
+
+[[noreturn]] void Become(const std::vector<std::string>& arguments) {
+    std::vector<char*> argv{const_cast<char*>(MOVIECONV_PROGRAM)};
+    for (const std::string& argument : arguments) {
+        argv.push_back(const_cast<char*>(argument.c_str()));
+    }
+    argv.push_back(nullptr);
+    execv(MOVIECONV_PROGRAM, argv.data());
+    _exit(127);
+}
+
+int Code(int status) {
+    return WIFEXITED(status) ? WEXITSTATUS(status) : 128 + WTERMSIG(status);
+}
+
+std::string ReadAll(std::FILE* file) {
+    std::rewind(file);
+    std::string text;
+    for (int c = std::fgetc(file); c != EOF; c = std::fgetc(file)) {
+        text += static_cast<char>(c);
+    }
+    std::fclose(file);
+    return text;
+}
+
+} // namespace
+
+Result Call(const std::vector<std::string>& arguments) {
+    std::FILE* out = std::tmpfile();
+    std::FILE* err = std::tmpfile();
+    const pid_t child = fork();
+    if (child == 0) {
+        dup2(open("/dev/null", O_RDONLY), 0);
+        dup2(fileno(out), 1);
+        dup2(fileno(err), 2);
+        Become(arguments);
+    }
+    int status = 0;
+    waitpid(child, &status, 0);
+    return {Code(status), ReadAll(out), ReadAll(err)};
+}
+
+Running::Running(const std::vector<std::string>& arguments, bool terminal) {
+    if (terminal) {
+        winsize size{24, 100, 0, 0};
+        child_ = forkpty(&output_, nullptr, nullptr, &size);
+        if (child_ == 0) {
+            setenv("TERM", "xterm", 1);
+            Become(arguments);
+        }
+        return;
+    }
+    int ends[2] = {-1, -1};
+    if (pipe2(ends, O_CLOEXEC) != 0) {
+        return;
+    }
+    child_ = fork();
+    if (child_ == 0) {
+        dup2(open("/dev/null", O_RDONLY), 0);
+        dup2(ends[1], 1);
+        Become(arguments);
+    }
+    close(ends[1]);
+    output_ = ends[0];
+}
+
+Running::~Running() {
+    if (child_ > 0) {
+        kill(child_, SIGKILL);
+        waitpid(child_, nullptr, 0);
+    }
+    close(output_);
+}
+
+bool Running::ReadSome() {
+    char buffer[4096];
+    const ssize_t count = read(output_, buffer, sizeof buffer);
+    if (count > 0) {
+        printed_.append(buffer, static_cast<std::size_t>(count));
+    }
+    return count > 0; // a terminal whose program has ended gives an error
+}
+
+bool Running::WaitFor(const std::string& text) {
+    for (;;) {
+        const std::size_t at = printed_.find(text, seen_);
+        if (at != std::string::npos) {
+            seen_ = at + text.size();
+            return true;
+        }
+        if (!ReadSome()) {
+            return false;
+        }
+    }
+}
+
+void Running::Signal(int signal) const {
+    kill(child_, signal);
+}
+
+void Running::Press(const std::string& keys) const {
+    if (write(output_, keys.data(), keys.size()) != static_cast<ssize_t>(keys.size())) {
+        std::perror("cannot press a key");
+    }
+}
+
+Result Running::Finish() {
+    while (ReadSome()) {
+    }
+    int status = 0;
+    waitpid(child_, &status, 0);
+    child_ = -1;
+    return {Code(status), printed_, {}};
+}
+
+} // namespace program

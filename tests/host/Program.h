@@ -1,0 +1,47 @@
+// Runs the program as a user would.
+#ifndef MOVIECONV_TESTS_HOST_PROGRAM_H
+#define MOVIECONV_TESTS_HOST_PROGRAM_H
+
+#include <string>
+#include <sys/types.h>
+#include <vector>
+
+namespace program {
+
+struct Result {
+    int code; ///< Exit code, or 128 plus the signal that ended it.
+    std::string out;
+    std::string err;
+};
+
+/// Runs movieconv to its end.
+Result Call(const std::vector<std::string>& arguments);
+
+/// A movieconv that runs beside the test.
+class Running {
+public:
+    /// On a terminal, standard output and standard error come together and keys can be pressed.
+    Running(const std::vector<std::string>& arguments, bool terminal);
+    Running(const Running&) = delete;
+    Running& operator=(const Running&) = delete;
+    ~Running();
+
+    /// Reads what it prints until `text` has come once more since the last call. False when it ended before.
+    bool WaitFor(const std::string& text);
+
+    void Signal(int signal) const;
+    void Press(const std::string& keys) const;
+    Result Finish();
+
+private:
+    bool ReadSome();
+
+    pid_t child_ = -1;
+    int output_ = -1;
+    std::string printed_;
+    std::size_t seen_ = 0;
+};
+
+} // namespace program
+
+#endif

@@ -1,0 +1,396 @@
+// Whole conversions, looked at from outside.
+#include "tests/host/Program.h"
+#include "tests/host/Inspect.h"
+#include "tests/host/TestMovies.h"
+
+#include <gtest/gtest.h>
+
+#include <cmath>
+#include <csignal>
+#include <filesystem>
+#include <fstream>
+#include <iterator>
+#include <sys/mount.h>
+
+namespace {
+
+namespace fs = std::filesystem;
+using namespace test_movies;
+using namespace inspect;
+using program::Call;
+using program::Result;
+using program::Running;
+using Args = std::vector<std::string>;
+
+const Args kLossless{"-c:v", "mpeg4", "-q:v", "2", "-c:a", "pcm_s16le"};
+
+std::string Counted() {
+    return Make("counted-av.mkv", Join(CountedPictures(4), Beeps(4), kLossless));
+}
+std::string Flashing() {
+    return Make("flashing.mp4",
+                Join(FlashPictures(8), Beeps(8), Args{"-c:v", "libx264", "-bf", "2", "-c:a", "aac"}));
+}
+
+std::string Content(const std::string& path) {
+    std::ifstream file(path, std::ios::binary);
+    return {std::istreambuf_iterator<char>(file), {}};
+}
+
+std::vector<std::string> FilesIn(const std::string& folder) {
+    std::vector<std::string> names;
+    for (const auto& entry : fs::directory_iterator(folder)) {
+        names.push_back(entry.path().filename().string());
+    }
+    std::sort(names.begin(), names.end());
+    return names;
+}
+
+Seen LookAt(const std::string& path) {
+    host::Movie movie(path, {});
+    return TakeAll(movie);
+}
+
+void ExpectInStep(const std::string& path, std::size_t flashes) {
+    host::Movie movie(path, {});
+    const Seen seen = TakeAll(movie);
+    const std::vector<double> light = Flashes(seen);
+    const std::vector<double> sound = Beginnings(seen, movie.Info().sound->sampleRate);
+    ASSERT_EQ(light.size(), flashes) << path;
+    ASSERT_EQ(sound.size(), flashes) << path;
+    for (std::size_t i = 0; i < flashes; ++i) {
+        EXPECT_NEAR(light[i], sound[i], 0.025) << path << ", flash " << i;
+    }
+}
+
+TEST(Program, WritesEveryPictureOnceAndAllSound) {
+    const Folder folder;
+    const Result result = Call({Counted(), folder / "out.mp4", "--video-rate", "2M"});
+    ASSERT_EQ(result.code, 0) << result.err;
+    EXPECT_EQ(result.err, "");
+    EXPECT_NE(result.out.find("100% done"), std::string::npos) << result.out;
+    EXPECT_EQ(result.out.find('\r'), std::string::npos);
+    EXPECT_EQ(FilesIn(folder.Path()), Args{"out.mp4"});
+
+    host::Movie movie(folder / "out.mp4", {});
+    EXPECT_EQ(movie.Info().pictures->codec, "mpeg4");
+    EXPECT_EQ(movie.Info().sound->codec, "aac");
+    EXPECT_NEAR(movie.Info().duration, 4, 0.04);
+    const Seen seen = TakeAll(movie);
+    ASSERT_EQ(seen.pictures.size(), 100u);
+    for (int i = 0; i < 100; ++i) {
+        EXPECT_NEAR(seen.pictures[i].luma, LumaOf(i), 3) << i;
+        EXPECT_NEAR(seen.pictures[i].time, i / 25.0, 0.001) << i;
+    }
+    EXPECT_GE(seen.sound.size(), 4u * 44100 - 441);
+    EXPECT_LE(seen.sound.size(), 4u * 44100 + 1024);
+}
+
+TEST(Program, KeepsSoundAndPicturesInStep) {
+    const Folder folder;
+    ASSERT_EQ(Call({Flashing(), folder / "out.mp4"}).code, 0);
+    ExpectInStep(folder / "out.mp4", 8);
+    ASSERT_EQ(Call({Flashing(), folder / "part.mkv", "--begin", "2.5", "--length", "4"}).code, 0);
+    ExpectInStep(folder / "part.mkv", 4);
+}
+
+TEST(Program, SplitsIntoClipsInStep) {
+    const Folder folder;
+    const Result result = Call({Flashing(), folder / "clip.mp4", "--split", "2.4"});
+    ASSERT_EQ(result.code, 0) << result.err;
+    const std::vector<std::string> names = FilesIn(folder.Path());
+    EXPECT_GE(names.size(), 4u);
+    std::size_t pictures = 0;
+    std::size_t flashes = 0;
+    for (const std::string& name : names) {
+        SCOPED_TRACE(name);
+        host::Movie movie(folder / name, {});
+        const Seen seen = TakeAll(movie);
+        pictures += seen.pictures.size();
+        const std::vector<double> light = Flashes(seen);
+        const std::vector<double> sound = Beginnings(seen, 44100);
+        ASSERT_EQ(light.size(), sound.size());
+        for (std::size_t i = 0; i < light.size(); ++i) {
+            EXPECT_NEAR(light[i], sound[i], 0.025) << i;
+        }
+        flashes += light.size();
+    }
+    EXPECT_EQ(pictures, 200u);
+    EXPECT_EQ(flashes, 8u);
+}
+
+struct Odd {
+    const char* name;
+    Args making;
+    Args options;
+    const char* output;
+    std::size_t pictures;
+    double sound; // seconds
+};
+
+class ProgramTakes : public testing::TestWithParam<Odd> {};
+
+TEST_P(ProgramTakes, AndConvertsAll) {
+    const Odd& odd = GetParam();
+    const Folder folder;
+    const std::string source = Make(std::string("odd-") + odd.name, odd.making);
+    const Result result = Call(Join(Args{source, folder / odd.output}, odd.options));
+    ASSERT_EQ(result.code, 0) << result.err;
+    const Seen seen = LookAt(folder / odd.output);
+    EXPECT_EQ(seen.pictures.size(), odd.pictures);
+    host::Movie movie(folder / odd.output, {});
+    const double seconds =
+        movie.Info().sound ? static_cast<double>(seen.sound.size()) / movie.Info().sound->sampleRate : 0;
+    EXPECT_NEAR(seconds, odd.sound, odd.sound > 0 ? 0.06 : 0);
+}
+
+// A part has the pictures shown at its begin and at its end, and one more: the engine stops after a picture.
+INSTANTIATE_TEST_SUITE_P(
+    Sources, ProgramTakes,
+    testing::Values(
+        Odd{"size.mkv",
+            Join(CountedPictures(1), Args{"-vf", "scale=161:121", "-c:v", "ffv1"}),
+            {},
+            "o.mp4",
+            25,
+            0},
+        Odd{"mono8.wav", Join(Beeps(2), Args{"-c:a", "pcm_u8", "-ar", "8000"}), {}, "o.m4a", 0, 2},
+        Odd{"surround.mkv",
+            Join(CountedPictures(1), Beeps(1), Args{"-c:v", "mpeg4", "-c:a", "ac3", "-ac", "6"}),
+            {},
+            "o.mp4",
+            25,
+            1},
+        Odd{"silent.mp4", Join(CountedPictures(1), Args{"-c:v", "libx264"}), {}, "o.mp4", 25, 0},
+        Odd{"one.mp4", Join(CountedPictures(0.04), Args{"-c:v", "libx264"}), {}, "o.mp4", 1, 0},
+        Odd{"short-sound.mkv", Join(CountedPictures(3), Beeps(1), kLossless), {}, "o.mp4", 75, 3},
+        Odd{"long-sound.mkv", Join(CountedPictures(1), Beeps(3), kLossless), {}, "o.mp4", 25, 3},
+        Odd{"late-sound.mkv",
+            Join(CountedPictures(3), Args{"-itsoffset", "1"}, Beeps(2), kLossless),
+            {},
+            "o.avi",
+            75,
+            3},
+        Odd{"plain.mkv", Join(CountedPictures(2), Beeps(2), kLossless), {"--no-audio"}, "o.mkv", 50, 0},
+        Odd{"plain.mkv", Join(CountedPictures(2), Beeps(2), kLossless), {"--no-video"}, "o.mp3", 0, 2},
+        Odd{"plain.mkv",
+            Join(CountedPictures(2), Beeps(2), kLossless),
+            {"--begin", "0.5", "--length", "1"},
+            "o.webm",
+            27,
+            1},
+        Odd{"plain.mkv",
+            Join(CountedPictures(2), Beeps(2), kLossless),
+            {"--size", "80x80", "--frame-rate", "12.5", "--video-codec", "h264"},
+            "o.ts",
+            25,
+            2}));
+
+TEST(Program, TakesNamesInAnyScript) {
+    const Folder folder;
+    const std::string dashed = folder / "-y";
+    fs::copy_file(Counted(), dashed);
+    const Args names{"фильм 映画.mp4", "it's 100%d \"quoted\".tar.mp4", "[a,b].mp4", "\xff\xfe raw.mp4",
+                     std::string(247, 'n') + ".mp4"};
+    for (const std::string& name : names) {
+        const Result result = Call({"--length", "0.4", "--split", "0.2", "--", dashed, folder / name});
+        EXPECT_EQ(result.code, 0) << name << ": " << result.err;
+        const std::string stem = name.substr(0, name.rfind('.'));
+        EXPECT_TRUE(fs::exists(folder / (stem + "_00.mp4"))) << name;
+        EXPECT_TRUE(fs::exists(folder / (stem + "_01.mp4"))) << name;
+    }
+}
+
+TEST(Program, RefusesAndLeavesEverythingAsItWas) {
+    const Folder folder;
+    const std::string source = folder / "in.mkv";
+    fs::copy_file(Counted(), source);
+    fs::create_hard_link(source, folder / "same.mkv");
+    std::ofstream(folder / "there.mp4") << "precious";
+    std::ofstream(folder / "clip_03.mp4") << "precious";
+    const std::vector<std::string> before = FilesIn(folder.Path());
+    struct Refusal {
+        Args arguments;
+        int code;
+        const char* word;
+    };
+    const std::vector<Refusal> refusals{
+        {{source, source, "-y"}, 2, "source itself"},
+        {{source, folder / "same.mkv", "-y"}, 2, "source itself"},
+        {{source, folder / "there.mp4"}, 4, "--overwrite"},
+        {{source, folder / "clip.mp4", "--split", "1"}, 4, "clip_03.mp4"},
+        {{source, folder / "clip", "--split", "1", "-f", "mp4"}, 2, "extension"},
+        {{source, folder / "nowhere/out.mp4"}, 4, "nowhere"},
+        {{source, folder / "out.xyz"}, 2, "--format"},
+        {{source, folder / "out"}, 2, "--format"},
+        {{folder / "none.mkv", folder / "out.mp4"}, 3, "none.mkv"},
+        {{folder / "there.mp4", folder / "out.mp4"}, 3, "there.mp4"},
+        {{source, folder / "out.mp4", "--begin", "9"}, 2, "--begin"},
+        {{source, folder / "out.mp4", "--begin", "soon"}, 2, "soon"},
+        {{source, folder / "out.webm", "--video-codec", "XVID"}, 2, "XVID"},
+        {{source, folder / "out.mp4", "--no-video", "--no-audio"}, 2, "--no-audio"},
+        {{source, folder / "out.mp3", "--no-audio"}, 2, "MP3"},
+        {{source}, 2, "OUTPUT"},
+        {{}, 2, "INPUT"},
+        {{"--nonsense"}, 2, "--help"},
+    };
+    for (const Refusal& refusal : refusals) {
+        const Result result = Call(refusal.arguments);
+        EXPECT_EQ(result.code, refusal.code) << result.err;
+        EXPECT_NE(result.err.find(refusal.word), std::string::npos) << result.err;
+        EXPECT_EQ(FilesIn(folder.Path()), before) << result.err;
+    }
+    EXPECT_EQ(Content(folder / "there.mp4"), "precious");
+    EXPECT_EQ(Content(source), Content(Counted()));
+    EXPECT_EQ(Call({source, folder / "there.mp4", "-y"}).code, 0);
+    EXPECT_GT(fs::file_size(folder / "there.mp4"), 1000u);
+}
+
+TEST(Program, PrintsValidJsonAndNothingElse) {
+    const Folder folder;
+    const Result result = Call({Counted(), folder / "a \"b\"\n\xff.mp4", "--progress", "json", "--split", "2",
+                                "--log", folder / "log"});
+    ASSERT_EQ(result.code, 0) << result.err;
+    EXPECT_EQ(result.err, "");
+    std::ofstream(folder / "events") << result.out;
+    const char* check =
+        "import json, sys\n"
+        "events = [json.loads(line) for line in open(sys.argv[1], encoding='utf-8', newline='\\n')]\n"
+        "kinds = [e['event'] for e in events]\n"
+        "assert all(e['v'] == 1 for e in events)\n"
+        "assert kinds[0] == 'start' and kinds[-1] == 'end'\n"
+        "assert kinds.count('clip_opened') == kinds.count('clip_closed') >= 2\n"
+        "assert events[-1]['exit_code'] == 0 and events[-1]['outcome'] == 'done'\n"
+        "assert all(e['percent'] < 100 for e in events if e['event'] == 'progress')\n";
+    EXPECT_EQ(RunProgram({"python3", "-c", check, folder / "events"}), 0) << result.out;
+    EXPECT_NE(Content(folder / "log").find("Encoding thread Exit."), std::string::npos);
+}
+
+TEST(Program, KeepsAPreview) {
+    const Folder folder;
+    ASSERT_EQ(Call({Counted(), folder / "out.mp4", "--preview", folder / "now.png"}).code, 0);
+    const Seen seen = LookAt(folder / "now.png");
+    ASSERT_EQ(seen.pictures.size(), 1u);
+    EXPECT_EQ(seen.pictures[0].width, 160);
+    EXPECT_NEAR(seen.pictures[0].luma, LumaOf(99), 4);
+}
+
+TEST(Program, TellsAboutSourcesFormatsAndRoom) {
+    const Folder folder;
+    const Result info = Call({"--info", Counted()});
+    EXPECT_EQ(info.code, 0);
+    EXPECT_NE(info.out.find("160 x 120"), std::string::npos) << info.out;
+    const Result estimate = Call({"--estimate", Counted(), folder / "out.mp4"});
+    EXPECT_EQ(estimate.code, 0) << estimate.err;
+    EXPECT_NE(estimate.out.find("320.0 kB"), std::string::npos) << estimate.out; // 640 kbit/s for 4 s
+    EXPECT_NE(Call({"--list-formats"}).out.find("MKV"), std::string::npos);
+    EXPECT_NE(Call({"--help"}).out.find("--split"), std::string::npos);
+    EXPECT_NE(Call({"--version"}).out.find("movieconv 1."), std::string::npos);
+}
+
+/// Slow enough that a test can interfere: an expensive codec at a large size.
+Args Slowly(const std::string& output) {
+    const std::string source = Make("minute.mkv", Join(CountedPictures(60), Beeps(60), kLossless));
+    return {source, output, "--video-codec", "HEVC", "--size", "960x720"};
+}
+
+class ProgramSignal : public testing::TestWithParam<int> {};
+
+TEST_P(ProgramSignal, FinishesAPlayableFile) {
+    const Folder folder;
+    Running running(Join(Slowly(folder / "out.mp4"), Args{"--progress", "json"}), false);
+    ASSERT_TRUE(running.WaitFor("\"position_s\":1."));
+    running.Signal(GetParam());
+    const Result result = running.Finish();
+    EXPECT_EQ(result.code, 6) << result.out;
+    EXPECT_NE(result.out.find("\"outcome\":\"stopped\""), std::string::npos);
+    EXPECT_EQ(FilesIn(folder.Path()), Args{"out.mp4"});
+    const Seen seen = LookAt(folder / "out.mp4");
+    EXPECT_GE(seen.pictures.size(), 20u);
+    EXPECT_LT(seen.pictures.size(), 1500u);
+}
+
+INSTANTIATE_TEST_SUITE_P(Signals, ProgramSignal, testing::Values(SIGINT, SIGTERM));
+
+TEST(Program, LeavesAtOnceOnTheSecondSignal) {
+    const Folder folder;
+    Running running(Join(Slowly(folder / "out.mp4"), Args{"--progress", "json"}), false);
+    ASSERT_TRUE(running.WaitFor("\"position_s\":1."));
+    running.Signal(SIGINT);
+    running.Signal(SIGTERM);
+    const Result result = running.Finish();
+    EXPECT_TRUE(result.code == 128 + SIGTERM || result.code == 128 + SIGINT) << result.code;
+    EXPECT_FALSE(fs::exists(folder / "out.mp4"));
+}
+
+TEST(Program, PausesResumesAndStopsByKeys) {
+    const Folder folder;
+    Running running(Slowly(folder / "out.mp4"), true);
+    ASSERT_TRUE(running.WaitFor("left"));
+    running.Press(" ");
+    ASSERT_TRUE(running.WaitFor("paused"));
+    running.Press("p");
+    ASSERT_TRUE(running.WaitFor("left"));
+    running.Press("q");
+    const Result result = running.Finish();
+    EXPECT_EQ(result.code, 6) << result.out;
+    EXPECT_GT(LookAt(folder / "out.mp4").pictures.size(), 0u);
+}
+
+TEST(Program, WritesTheSameFileWhateverThePauses) {
+    const Folder folder;
+    const Args encoding{"--length", "3", "--size", "640x480"};
+    ASSERT_EQ(Call(Join(Args{Flashing(), folder / "steady.mp4"}, encoding)).code, 0);
+    Running running(Join(Args{Flashing(), folder / "paused.mp4"}, encoding), true);
+    for (int i = 0; i < 6; ++i) {
+        running.Press(" ");
+        std::this_thread::sleep_for(std::chrono::milliseconds(10 + 17 * i % 50));
+    }
+    EXPECT_EQ(running.Finish().code, 0);
+    EXPECT_EQ(Content(folder / "steady.mp4"), Content(folder / "paused.mp4"));
+}
+
+/// A small disk; usable only where the test may mount one.
+class SmallDisk {
+public:
+    explicit SmallDisk(const std::string& path) : path_(path) {
+        fs::create_directory(path);
+        mounted_ = mount("tmpfs", path.c_str(), "tmpfs", 0, "size=600k") == 0;
+    }
+    ~SmallDisk() {
+        if (mounted_) {
+            umount2(path_.c_str(), MNT_DETACH);
+        }
+    }
+    SmallDisk(const SmallDisk&) = delete;
+    SmallDisk& operator=(const SmallDisk&) = delete;
+    bool IsThere() const { return mounted_; }
+
+private:
+    const std::string path_;
+    bool mounted_ = false;
+};
+
+TEST(Program, SaysThatTheDiskIsFullAndKeepsWhatIsDone) {
+    const Folder folder;
+    const SmallDisk disk(folder / "disk");
+    if (!disk.IsThere()) {
+        GTEST_SKIP() << "no small disk can be mounted here";
+    }
+    const Args making{Make("minute.mkv", Join(CountedPictures(60), Beeps(60), kLossless)),
+                      folder / "disk/out.mov", "--audio-codec", "PCM"};
+    const Result result = Call(making);
+    EXPECT_EQ(result.code, 5) << result.err;
+    EXPECT_NE(result.err.find("out.mov"), std::string::npos);
+    EXPECT_FALSE(fs::exists(folder / "disk/out.mov"));
+    const std::vector<std::string> left = FilesIn(folder / "disk");
+    ASSERT_EQ(left.size(), 1u);
+    EXPECT_NE(result.err.find(left[0]), std::string::npos) << result.err;
+    EXPECT_GT(LookAt(folder / "disk/" + left[0]).pictures.size(), 25u);
+
+    fs::remove(folder / "disk/" + left[0]);
+    EXPECT_EQ(Call(Join(making, Args{"--no-keep-partial"})).code, 5);
+    EXPECT_TRUE(FilesIn(folder / "disk").empty());
+}
+
+} // namespace

@@ -1,0 +1,13 @@
+# The code that README.md shows is the code that is built: it must stand in examples/minimal_host.cpp as it is.
+file(READ ${ROOT}/README.md readme)
+file(READ ${ROOT}/examples/minimal_host.cpp example)
+string(FIND "${readme}" "```cpp\n" start)
+math(EXPR start "${start} + 7")
+string(SUBSTRING "${readme}" ${start} -1 rest)
+string(FIND "${rest}" "```" end)
+string(SUBSTRING "${rest}" 0 ${end} shown)
+string(FIND "${example}" "${shown}" found)
+string(LENGTH "${shown}" length)
+if(found EQUAL -1 OR length LESS 100)
+  message(FATAL_ERROR "README.md shows other code than examples/minimal_host.cpp holds")
+endif()
