@@ -46,7 +46,7 @@ void Loop(benchmark::State& state, bool hasVideo, bool hasAudio) {
     const int64_t pictures = state.range(0);
     const double memory = PeakMemory();
     int64_t allocations = 0;
-    for (auto _ : state) {
+    while (state.KeepRunning()) {
         IdleVideo video(pictures);
         IdleAudio audio(2 * pictures);
         const int64_t before = Allocations();
@@ -78,7 +78,7 @@ BENCHMARK(Video)->Arg(kTenHours)->UseManualTime()->Unit(benchmark::kMillisecond)
 /// From MCStop to its return, while the loop runs (0) or is paused (1).
 void Stop(benchmark::State& state) {
     double longest = 0.0;
-    for (auto _ : state) {
+    while (state.KeepRunning()) {
         IdleVideo video(INT64_MAX);
         IdleAudio audio(INT64_MAX);
         const MCHandle handle = MCCreate(&video, &audio);

@@ -51,17 +51,14 @@ uint32_t DigestOf(const VideoImage& image) {
     return AddPlane(digest, image.pV, image.nPitchV, halfWidth, halfHeight);
 }
 
-std::string Utf8(const wchar_t* text) {
+/// The text with everything but ASCII as \u{CODE}.
+std::string Ascii(const wchar_t* text) {
     std::string bytes;
     for (; *text; ++text) {
-        const auto c = static_cast<uint32_t>(*text);
-        if (c < 0x80) {
-            bytes += static_cast<char>(c);
-            continue;
-        }
-        char escaped[16];
-        snprintf(escaped, sizeof escaped, "\\u{%X}", c);
-        bytes += escaped;
+        char character[16];
+        const bool ascii = *text > 0 && *text < 0x80;
+        snprintf(character, sizeof character, ascii ? "%c" : "\\u{%X}", static_cast<unsigned>(*text));
+        bytes += character;
     }
     return bytes;
 }
@@ -173,7 +170,7 @@ void* MWCreateMediaFile(const wchar_t* fileName, const EncodeParam* param, const
     const std::lock_guard guard(g_mutex);
     g_state.params.push_back(*param);
     const int number = static_cast<int>(g_state.params.size());
-    std::string line = "create " + Utf8(fileName);
+    std::string line = "create " + Ascii(fileName);
     line += video ? Format(" %dx%d@%g", video->nWidth, video->nHeight, video->dFrameRate) : " -";
     line += audio ? Format(" %d/%d", audio->nSampleRate, audio->nChannels) : " -";
     const bool fails = g_state.failing.count(number) > 0;
