@@ -22,11 +22,27 @@ inline std::string LevelName(const testing::TestParamInfo<image::KernelLevel>& i
     return "Unknown";
 }
 
-/// Skips a level that the machine lacks.
+#ifdef MOVIECONV_EMULATED_AVX512
+namespace image {
+extern const RowKernels kEmulatedAvx512Kernels;
+}
+#endif
+
+/// The kernels of a level, emulated where the machine lacks it and an emulation was built.
+inline const image::RowKernels* TestedKernels(image::KernelLevel level) {
+    const image::RowKernels* kernels = image::RowKernelsFor(level);
+#ifdef MOVIECONV_EMULATED_AVX512
+    if (kernels == nullptr && level == image::KernelLevel::kAvx512)
+        return &image::kEmulatedAvx512Kernels;
+#endif
+    return kernels;
+}
+
+/// Skips a level that can't be run.
 class LevelTest : public testing::TestWithParam<image::KernelLevel> {
 protected:
     void SetUp() override {
-        kernels = image::RowKernelsFor(GetParam());
+        kernels = TestedKernels(GetParam());
         if (kernels == nullptr)
             GTEST_SKIP() << "this machine lacks the level";
     }

@@ -10,6 +10,16 @@ namespace {
 /// What the routines use; null until the first of them asks.
 std::atomic<const RowKernels*> g_kernels{nullptr};
 
+#ifdef MOVIECONV_X86_KERNELS
+/// Whether the processor has, and the system saves the registers of, everything that the AVX-512 file is
+/// compiled for.
+bool HasAvx512() {
+    return __builtin_cpu_supports("avx512f") && __builtin_cpu_supports("avx512bw") &&
+           __builtin_cpu_supports("avx512vl") && __builtin_cpu_supports("avx512vbmi") &&
+           __builtin_cpu_supports("avx512vnni");
+}
+#endif
+
 } // namespace
 
 const RowKernels* RowKernelsFor(KernelLevel level) {
@@ -21,6 +31,8 @@ const RowKernels* RowKernelsFor(KernelLevel level) {
         return __builtin_cpu_supports("sse4.1") ? &kSse41Kernels : nullptr;
     case KernelLevel::kAvx2:
         return __builtin_cpu_supports("avx2") ? &kAvx2Kernels : nullptr;
+    case KernelLevel::kAvx512:
+        return HasAvx512() ? &kAvx512Kernels : nullptr;
 #endif
     default:
         return nullptr;

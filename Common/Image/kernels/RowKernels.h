@@ -90,6 +90,7 @@ void ForceRowKernels(KernelLevel level);
 extern const RowKernels kPlainKernels;
 extern const RowKernels kSse41Kernels;
 extern const RowKernels kAvx2Kernels;
+extern const RowKernels kAvx512Kernels;
 
 } // namespace image
 
