@@ -157,7 +157,13 @@ void ControlInput::LeaveAtOnce(int signal) {
                  fmt::format("\nmovieconv: left at once; what was written so far is in \"{}\"\n",
                              status->szTemporaryPath));
     }
-    _exit(128 + signal);
+    // Ends as if the signal had not been caught, which the shell shows as 128 plus its number.
+    std::signal(signal, SIG_DFL);
+    sigset_t set;
+    sigemptyset(&set);
+    sigaddset(&set, signal);
+    pthread_sigmask(SIG_UNBLOCK, &set, nullptr);
+    kill(getpid(), signal);
 }
 
 /// Makes keys arrive at once and unseen. Ctrl-C and Ctrl-Z still send signals.

@@ -326,7 +326,7 @@ TEST(Program, LeavesAtOnceOnTheSecondSignal) {
 TEST(Program, PausesResumesAndStopsByKeys) {
     const Folder folder;
     Running running(Slowly(folder / "out.mp4"), true);
-    ASSERT_TRUE(running.WaitFor("left"));
+    ASSERT_TRUE(running.WaitFor("0:00:01 / "));
     running.Press(" ");
     ASSERT_TRUE(running.WaitFor("paused"));
     running.Press("p");
