@@ -59,7 +59,9 @@ EncodeParam PlanEncoding(const EncodeParam& defaults, const FileFormatInfo& form
         param.nHeight = options.size->height;
     }
     param.bResize = options.fit == Fit::kStretch ? 1 : 0;
-    param.dFrameRate = options.frameRate.value_or(param.dFrameRate);
+    if (options.frameRate) { // no reference to the record's double, which lies on a 4-byte boundary
+        param.dFrameRate = *options.frameRate;
+    }
     param.nVideoBitrate = options.videoRate.value_or(param.nVideoBitrate);
     param.nVideoMaxBitrate = options.videoMaxRate.value_or(0);
     param.nVideoRateMode = options.videoMaxRate ? 1 : 0;
