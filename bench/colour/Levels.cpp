@@ -13,10 +13,10 @@ constexpr int kUpToAvx2 = kUpToSse41 | libyuv::kCpuHasSSE42 | libyuv::kCpuHasAVX
                           libyuv::kCpuHasERMS | libyuv::kCpuHasFMA3 | libyuv::kCpuHasF16C;
 
 constexpr Level kLevels[] = {
-    {KernelLevel::kPlain, "plain", libyuv::kCpuInitialized},
-    {KernelLevel::kSse41, "SSE4.1", kUpToSse41},
-    {KernelLevel::kAvx2, "AVX2", kUpToAvx2},
-    {KernelLevel::kAvx512, "AVX-512", -1},
+    {"plain", KernelLevel::kPlain, libyuv::kCpuInitialized},
+    {"SSE4.1", KernelLevel::kSse41, kUpToSse41},
+    {"AVX2", KernelLevel::kAvx2, kUpToAvx2},
+    {"AVX-512", KernelLevel::kAvx512, -1},
 };
 static_assert(std::size(kLevels) == std::size(image::kKernelLevels));
 

@@ -10,8 +10,8 @@
 namespace bench {
 
 struct Level {
-    image::KernelLevel kernels;
     const char* name;
+    image::KernelLevel kernels;
     int libyuvFlags; ///< What libyuv may use at most.
 };
 
