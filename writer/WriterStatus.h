@@ -17,8 +17,8 @@ extern "C" {
 /// Where a file is in its life.
 enum {
     kWriterFileWriting = 1, ///< Pictures and sound are being taken.
-    kWriterFileFinishing =
-        2, ///< Closed by the engine; the rest is being encoded, the index written, the file synced.
+    /// Closed by the engine; the rest is being encoded, the index written, the file synced.
+    kWriterFileFinishing = 2,
     kWriterFileComplete = 3, ///< Complete, on the disk, under its real name.
     kWriterFileFailed = 4    ///< Not complete and never will be; see nError. The real name was not touched.
 };
@@ -48,8 +48,8 @@ typedef struct WriterStatus {
     int32_t nError;       ///< kWriterError...; the first one of this file stays.
     int32_t nSystemError; ///< errno of the failed call, 0 when the fault is not the system's.
 
-    int64_t
-        llBytesWritten; ///< Size of the file so far (temporary or final), as far as it has left the writer.
+    /// Size of the file so far (temporary or final), as far as it has left the writer.
+    int64_t llBytesWritten;
     int64_t llPicturesReceived; ///< Pictures taken by MWWriteVideoFrame.
     int64_t llPicturesWritten;  ///< Pictures in the file, repeated ones counted.
     int64_t llPicturesDropped;  ///< Pictures left out because a lower frame rate was asked for.
@@ -82,8 +82,8 @@ enum {
     kWriterEventOpened = 1,  ///< A file was created and takes pictures and sound.
     kWriterEventRefused = 2, ///< A file could not be created: MWCreateMediaFile is about to return null.
     kWriterEventFailed = 3,  ///< Writing failed; nothing more is taken. Comes once, long before the close.
-    kWriterEventFinishing =
-        4, ///< The close goes on; comes at its start and whenever dFinished has grown visibly.
+    /// The close goes on; comes at its start and whenever dFinished has grown visibly.
+    kWriterEventFinishing = 4,
     kWriterEventClosed = 5 ///< The file is complete, or the failed one is closed.
 };
 
@@ -106,13 +106,14 @@ typedef struct WriterOptions {
     int32_t nColorPrimaries; ///< As in ISO/IEC 23091-2; 0 or 2: not stated.
     int32_t nColorTransfer;  ///< As in ISO/IEC 23091-2; 0 or 2: not stated.
     int32_t nColorMatrix;    ///< As in ISO/IEC 23091-2; 0 or 2: not stated.
-    int32_t
-        nEncoderThreads;    ///< Threads of the picture encoder; 0: one, whose output never depends on timing.
-    int32_t bBitExact;      ///< Nonzero: nothing in the file tells time, date or library version.
-    int32_t bKeepExisting;  ///< Nonzero: a target that exists is never replaced; creating it fails.
-    int32_t bRemovePartial; ///< Nonzero: a failed file's temporary file is removed; by default it stays,
-                            ///< playable.
-    WriterListener pfnListener;        ///< May be null.
+    /// Threads of the picture encoder; 0: one, or for H.264, HEVC, VP8 and VP9 one a processor, 8 at most.
+    /// The number may change the output, timing never does.
+    int32_t nEncoderThreads;
+    int32_t bBitExact;          ///< Nonzero: nothing in the file tells time, date or library version.
+    int32_t bKeepExisting;      ///< Nonzero: a target that exists is never replaced; creating it fails.
+    int32_t bRemovePartial;     ///< Nonzero: a failed file's temporary file is removed; by default it stays,
+                                ///< playable.
+    WriterListener pfnListener; ///< May be null.
     WriterFullDiskHandler pfnFullDisk; ///< Null: a full disk fails the file at once.
     void* pContext;                    ///< First argument of both.
 } WriterOptions;
