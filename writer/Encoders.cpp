@@ -163,8 +163,11 @@ VideoEncoder::VideoEncoder(const VideoCodec& codec, const VideoSettings& setting
         context.rc_buffer_size = static_cast<int>(std::min<int64_t>(context.rc_max_rate * 2, INT32_MAX));
     }
     context.thread_count = settings.threads;
-    if (settings.inOrder)
+    if (settings.inOrder) {
         context.max_b_frames = 0;
+        if (codec.id == AV_CODEC_ID_MPEG2VIDEO) // whose readers otherwise allow for one picture of reordering
+            context.flags |= AV_CODEC_FLAG_LOW_DELAY;
+    }
     context.color_range = settings.fullRange ? AVCOL_RANGE_JPEG : AVCOL_RANGE_MPEG;
     context.color_primaries = settings.primaries;
     context.color_trc = settings.transfer;

@@ -26,6 +26,12 @@ bool HasPictures(const AVFormatContext& output) {
     });
 }
 
+/// Whether a packet of sound holds little but its codec's run-up. Where time is a count from 0 on, such a
+/// packet would be heard and move all sound away from the pictures.
+bool IsRunUp(const AVPacket& packet, const AVStream& stream) {
+    return stream.codecpar->codec_type == AVMEDIA_TYPE_AUDIO && packet.pts + packet.duration / 2 < 0;
+}
+
 void SetFragments(const AVFormatContext& output, av::Options& options) {
     // Times are written as they are, from the first fragment on.
     std::string flags = "empty_moov+default_base_moof+frag_discont";
@@ -88,6 +94,8 @@ void Muxer::Write(AVPacket& packet, int stream) {
     State& state = streams_[static_cast<size_t>(stream)];
     const AVStream* out = output_->streams[stream];
     NoteTimes(state, packet);
+    if (container_.kind == ContainerKind::kSteadyRate && HasPictures(*output_) && IsRunUp(packet, *out))
+        return;
     av_packet_move_ref(packet_.get(), &packet);
     av_packet_rescale_ts(packet_.get(), state.unit, out->time_base);
     packet_->pts += state.delay;
@@ -121,7 +129,7 @@ Muxer::Written Muxer::Stream(int stream) const {
 }
 
 void Muxer::NoteTimes(State& state, const AVPacket& packet) {
-    if (state.lastDts == AV_NOPTS_VALUE)
+    if (!std::exchange(state.begun, true))
         state.firstPts = state.endPts = packet.pts;
     state.firstPts = std::min(state.firstPts, packet.pts);
     state.endPts = std::max(state.endPts, packet.pts + packet.duration);

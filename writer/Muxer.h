@@ -56,6 +56,7 @@ private:
         int64_t runUp = 0;
         int64_t delay = 0; ///< In the file's unit.
         int64_t lastDts = AV_NOPTS_VALUE;
+        bool begun = false;
         int64_t firstPts = 0; ///< In the stream's own unit, as endPts.
         int64_t endPts = 0;
     };

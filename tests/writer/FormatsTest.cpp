@@ -6,6 +6,7 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cmath>
 #include <string>
 #include <vector>
@@ -44,6 +45,13 @@ std::vector<Pair> AllPairs() {
     return pairs;
 }
 
+/// Seconds at which the sound is no longer silent.
+double ToneBegins(const ReadMovie& read) {
+    const auto loud = std::find_if(read.firstChannel.begin(), read.firstChannel.end(),
+                                   [](float sample) { return std::abs(sample) > 0.2F; });
+    return read.audioStart + static_cast<double>(loud - read.firstChannel.begin()) / read.sampleRate;
+}
+
 class Formats : public testing::TestWithParam<Pair> {};
 
 TEST_P(Formats, AreReadBackComplete) {
@@ -52,6 +60,7 @@ TEST_P(Formats, AreReadBackComplete) {
     TestMovie movie;
     movie.pictures = 30;
     movie.soundSeconds = 1.2;
+    movie.quietSeconds = 0.4;
     movie.param.fccFileFormat = pair.format;
     movie.param.fccVideo = pair.video;
     movie.param.fccAudio = pair.audio;
@@ -81,6 +90,7 @@ TEST_P(Formats, AreReadBackComplete) {
         for (size_t i = 0; i < read.pictures.size(); ++i)
             ASSERT_NEAR(read.pictures[i].time - start, static_cast<double>(i) / 25.0, 0.0011) << i;
         EXPECT_NEAR(read.audioStart, start, 0.04);
+        EXPECT_NEAR(ToneBegins(read) - start, movie.quietSeconds, 0.01);
         EXPECT_NEAR(read.duration, 1.2, 0.1);
     }
 

@@ -13,6 +13,7 @@
 namespace {
 
 constexpr int64_t kSecond = 10'000'000;
+constexpr double kFrequency = 440.0;
 
 } // namespace
 
@@ -71,7 +72,7 @@ const VideoImage& TestPicture::Paint(int number, int64_t time) {
     return image_;
 }
 
-TestSound::TestSound(int rate, int channels, int bits, double frequency) : frequency_(frequency) {
+TestSound::TestSound(int rate, int channels, int bits, double quiet) : quiet_(quiet) {
     frame_.nType = 2;
     frame_.nSampleRate = rate;
     frame_.nChannels = channels;
@@ -82,7 +83,8 @@ const AudioFrame& TestSound::Next(int samples, int64_t time) {
     const int size = frame_.nBitsPerSample / 8;
     data_.clear();
     for (int i = 0; i < samples; ++i, ++position_) {
-        const double value = 0.5 * std::sin(2 * M_PI * frequency_ * position_ / frame_.nSampleRate);
+        const double time = static_cast<double>(position_) / frame_.nSampleRate;
+        const double value = time < quiet_ ? 0.0 : 0.5 * std::sin(2 * M_PI * kFrequency * time);
         auto wide = static_cast<int32_t>(std::lround(value * 2147483647.0));
         if (size == 1)
             wide ^= INT32_MIN;
@@ -120,7 +122,7 @@ void* TestMovie::Create(const std::string& path) const {
 
 void TestMovie::WriteAll(void* file) const {
     TestPicture picture(width, height, pitchExtra);
-    TestSound sound(sampleRate, channels, bits);
+    TestSound sound(sampleRate, channels, bits, quietSeconds);
     const int64_t samples = std::llround(soundSeconds * sampleRate);
     int64_t written = 0;
     const auto write_sound = [&](int64_t until) {

@@ -42,10 +42,10 @@ private:
     VideoImage image_{};
 };
 
-/// A tone in blocks.
+/// A tone in blocks, after `quiet` seconds of silence.
 class TestSound {
 public:
-    TestSound(int rate, int channels, int bits, double frequency = 440.0);
+    TestSound(int rate, int channels, int bits, double quiet = 0.0);
 
     /// The next `samples` sample frames, stamped `time`.
     const AudioFrame& Next(int samples, int64_t time);
@@ -53,7 +53,7 @@ public:
 private:
     std::vector<unsigned char> data_;
     AudioFrame frame_{};
-    double frequency_;
+    double quiet_;
     int64_t position_ = 0;
 };
 
@@ -68,6 +68,7 @@ struct TestMovie {
     int channels = 2;
     int bits = 16;
     double soundSeconds = 2.0;
+    double quietSeconds = 0.0; ///< Silence at the start of the sound.
     EncodeParam param = Param();
     bool hasVideo = true;
     bool hasAudio = true;
