@@ -1,5 +1,6 @@
 option(MOVIECONV_BUILD_TESTS "Build the tests" ON)
 option(MOVIECONV_BUILD_BENCH "Build the benchmarks (64-bit builds only)" ON)
+option(MOVIECONV_BUILD_FUZZ "Build the fuzz targets (Clang only)" OFF)
 option(MOVIECONV_WERROR "Treat warnings as errors" OFF)
 
 if(CMAKE_SIZEOF_VOID_P EQUAL 4)

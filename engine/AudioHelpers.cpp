@@ -45,7 +45,7 @@ AudioFrame* get_small_frame(AudioDecoder* decoder) {
     const int32_t length = PieceLength(block, WrapSub(block.nLength, nPos));
     const int32_t bytesPerSecond =
         WrapMul(WrapMul(block.nChannels, block.nSampleRate), block.nBitsPerSample) / 8;
-    frame.pData = block.pData + nPos;
+    frame.pData = block.pData ? block.pData + nPos : nullptr;
     frame.nLength = length;
     frame.nBufferSize = length;
     frame.nDuration = Duration(length, bytesPerSecond);

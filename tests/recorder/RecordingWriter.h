@@ -55,6 +55,9 @@ std::vector<Written<VideoImage>> Pictures();
 /// The parameters of the creates since Reset.
 std::vector<EncodeParam> Params();
 
+/// Leaves the digests of later writes 0, for long recordings.
+void SkipDigests();
+
 /// Makes the creates with these numbers, from 1, fail.
 void FailCreates(std::set<int> numbers);
 
