@@ -7,10 +7,10 @@
 namespace host {
 namespace {
 
-constexpr std::size_t kPicturesAhead = 8;
+constexpr std::size_t kPicturesAhead = 4;
 constexpr std::size_t kBytesAhead = 256 << 20;
 constexpr int kTrialPictures = 40;
-constexpr int kWarmUpPictures = 2 * kPicturesAhead;
+constexpr int kWarmUpPictures = 16;
 constexpr std::size_t kTrialPackets = 400;
 constexpr unsigned kMostThreads = 16;
 

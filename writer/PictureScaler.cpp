@@ -18,6 +18,15 @@ namespace {
 
 constexpr int kAlignment = 64;
 
+/// Columns that FFmpeg's MPEG encoders keep beside their pictures, together.
+constexpr int kEncoderEdges = 32;
+
+/// The distance of rows at which those encoders take pictures of whole macroblocks as they are, without a
+/// copy of their own: all planes on whole cache lines, room for the edges.
+int AlignedWidth(int width) {
+    return FFALIGN(width + kEncoderEdges, 2 * kAlignment);
+}
+
 int EvenDown(int value) {
     return value & ~1;
 }
@@ -89,7 +98,7 @@ FramePool::~FramePool() {
 av::Frame FramePool::Get(AVPixelFormat format, int width, int height) {
     if (pool_ == nullptr || format != format_ || width != width_ || height != height_) {
         av_buffer_pool_uninit(&pool_);
-        const int size = av_image_get_buffer_size(format, FFALIGN(width, kAlignment), height, kAlignment);
+        const int size = av_image_get_buffer_size(format, AlignedWidth(width), height, kAlignment);
         pool_ = size < 0 ? nullptr : av_buffer_pool_init(static_cast<size_t>(size) + kAlignment, nullptr);
         format_ = format;
         width_ = width;
@@ -104,8 +113,8 @@ av::Frame FramePool::Get(AVPixelFormat format, int width, int height) {
     frame->format = format;
     frame->width = width;
     frame->height = height;
-    av_image_fill_arrays(frame->data, frame->linesize, frame->buf[0]->data, format,
-                         FFALIGN(width, kAlignment), height, kAlignment);
+    av_image_fill_arrays(frame->data, frame->linesize, frame->buf[0]->data, format, AlignedWidth(width),
+                         height, kAlignment);
     return frame;
 }
 
