@@ -1,8 +1,12 @@
-// Many conversions in one process, ended at random moments in every way there is: nothing may pile up.
-// MOVIECONV_ENDURANCE sets the number of rounds, two conversions each.
+// Many conversions in one process, two at a time, ended at random moments in every way there is: nothing may
+// pile up. MOVIECONV_ENDURANCE sets the number of rounds. Built twice: for the engine alone, over the
+// recording writer, and for the whole with the real one.
 #include "api/MovieConv.h"
 #include "tests/engine/IdleParts.h"
+
+#ifdef MOVIECONV_RECORDED
 #include "tests/recorder/RecordingWriter.h"
+#endif
 
 #include <gtest/gtest.h>
 
@@ -10,17 +14,22 @@
 #include <chrono>
 #include <cstdlib>
 #include <filesystem>
-#include <fstream>
 #include <iterator>
 #include <memory>
 #include <random>
+#include <string>
 #include <thread>
 
+#include <malloc.h>
 #include <unistd.h>
 
 namespace {
 
-constexpr int kWarmUpRounds = 40;
+constexpr int kWarmUpRounds = 40; // the writer remembers its last 64 files
+
+/// Bytes: one or two more files that the writer remembers because they were open when others were forgotten,
+/// and the threads' caches of small pieces, which count as in use.
+constexpr int64_t kAllowance = 24 << 10;
 
 int Rounds() {
     const char* asked = std::getenv("MOVIECONV_ENDURANCE");
@@ -32,13 +41,9 @@ int64_t Entries(const char* folder) {
     return std::distance(begin(entries), end(entries));
 }
 
-/// Resident memory in bytes.
+/// Bytes on the heap that are in use, of all threads together.
 int64_t Memory() {
-    std::ifstream statm("/proc/self/statm");
-    int64_t total = 0;
-    int64_t resident = 0;
-    statm >> total >> resident;
-    return resident * sysconf(_SC_PAGESIZE);
+    return static_cast<int64_t>(mallinfo2().uordblks);
 }
 
 struct Usage {
@@ -54,11 +59,11 @@ void DropEvents() {
 }
 
 struct Job {
-    explicit Job(int kind)
+    Job(int kind, const std::wstring& file)
         : video(kind == 1 ? 0 : 100000),
           audio(kind == 2 ? 0 : 200000),
           handle(MCCreate(kind == 1 ? nullptr : &video, kind == 2 ? nullptr : &audio)) {
-        MCSetOutputFile(handle, L"out.mp4");
+        MCSetOutputFile(handle, file.c_str());
         MCSetSplitParam(handle, kind == 0, 1000);
     }
     ~Job() { MCDestroy(handle); }
@@ -100,10 +105,11 @@ void End(std::unique_ptr<Job>& job, int ending) {
     job.reset();
 }
 
-void Round(std::mt19937& random) {
+void Round(std::mt19937& random, const std::wstring& folder) {
     std::unique_ptr<Job> jobs[2];
     for (auto& job : jobs) {
-        job = std::make_unique<Job>(static_cast<int>(random() % 3));
+        const std::wstring file = folder + (&job == jobs ? L"/a.mp4" : L"/b.mp4");
+        job = std::make_unique<Job>(static_cast<int>(random() % 3), file);
         ASSERT_NE(job->handle, nullptr);
         ASSERT_EQ(MCStart(job->handle, 0.0, 0.0, nullptr, Job::Callback, job.get()), 0);
     }
@@ -111,22 +117,27 @@ void Round(std::mt19937& random) {
         std::this_thread::sleep_for(std::chrono::microseconds(random() % 3000));
         End(job, static_cast<int>(random() % kEndings));
     }
-    recorder::Reset();
     DropEvents();
+#ifdef MOVIECONV_RECORDED
+    recorder::Reset();
+#endif
 }
 
 TEST(EnduranceTest, NothingPilesUp) {
+    const std::filesystem::path folder = testing::TempDir() + "endurance-" + std::to_string(getpid());
+    std::filesystem::create_directory(folder);
     std::mt19937 random(20);
     for (int i = 0; i < kWarmUpRounds; ++i)
-        Round(random);
+        Round(random, folder.wstring());
     const Usage before;
     for (int i = kWarmUpRounds; i < Rounds(); ++i)
-        Round(random);
+        Round(random, folder.wstring());
     const Usage after;
+    std::filesystem::remove_all(folder);
     EXPECT_LE(after.threads, before.threads);
     EXPECT_LE(after.descriptors, before.descriptors);
 #if !defined(__SANITIZE_ADDRESS__) && !defined(__SANITIZE_THREAD__) // these keep freed memory
-    EXPECT_LE(after.memory - before.memory, 24 << 20) << "bytes";
+    EXPECT_LE(after.memory - before.memory, kAllowance) << "bytes";
 #endif
 }
 

@@ -6,11 +6,18 @@
 
 #include <cstdint>
 
-/// `count` pictures, 25 a second.
+/// `count` black pictures, 25 a second.
 class IdleVideo : public VideoDecoder {
 public:
     explicit IdleVideo(int64_t count) : left(count) {
-        info.format = {320, 240, 25.0, static_cast<double>(count) / 25};
+        static unsigned char planes[160 * 120]{};
+        info.format = {160, 120, 25.0, static_cast<double>(count) / 25};
+        image.nType = kMediaTypePicture;
+        image.nFormat = kPictureFormatPlanar420;
+        image.pY = image.pU = image.pV = planes;
+        image.nWidth = image.nPitchY = 160;
+        image.nPitchU = image.nPitchV = 80;
+        image.nHeight = 120;
     }
     VideoSourceInfo* GetVideoInfo() override { return &info; }
     double Seek(double, int) override { return 0.0; }
@@ -26,12 +33,17 @@ private:
     int64_t left;
 };
 
-/// `count` blocks of 20 ms.
+/// `count` blocks of 20 ms of sound.
 class IdleAudio : public AudioDecoder {
 public:
     explicit IdleAudio(int64_t count) : left(count) {
         info.format = {8000, 1, 8, 8000, static_cast<double>(count) / 50};
-        block.nLength = 160;
+        static unsigned char samples[160]{};
+        block.nSampleRate = 8000;
+        block.nChannels = 1;
+        block.nBitsPerSample = 8;
+        block.pData = samples;
+        block.nLength = sizeof samples;
     }
     AudioSourceInfo* GetAudioInfo() override { return &info; }
     double Seek(double) override { return 0.0; }
