@@ -12,7 +12,10 @@
 
 #include <atomic>
 #include <cerrno>
+#include <cstring>
 #include <filesystem>
+#include <fstream>
+#include <iterator>
 #include <memory>
 #include <string>
 #include <thread>
@@ -137,46 +140,65 @@ protected:
     TestMovie movie_;
 };
 
-class FaultIn : public Fault, public testing::WithParamInterface<uint32_t> {};
+std::string Content(const std::string& path) {
+    std::ifstream file(path, std::ios::binary);
+    return {std::istreambuf_iterator<char>(file), {}};
+}
+
+struct Disk {
+    const char* name;
+    uint32_t format;
+    int error;
+};
+
+class FaultIn : public Fault, public testing::WithParamInterface<Disk> {};
 
 TEST_P(FaultIn, EveryWriteIsToldAndLeavesAPlayablePart) {
-    movie_.param.fccFileFormat = GetParam();
+    movie_.param.fccFileFormat = GetParam().format;
     movie_.param.fccAudio = FourCC("MP3 ");
+    const std::string earlier = folder_.Path("earlier");
+    ASSERT_TRUE(movie_.Write(earlier));
+    const std::string earlierContent = Content(earlier);
     const int writes = CountWrites();
     ASSERT_GT(writes, 1);
     for (int number = 0; number < writes; ++number) {
         SCOPED_TRACE("write " + std::to_string(number));
         Faults faults;
         faults.failingWrite = number;
+        faults.writeError = GetParam().error;
         const Outcome outcome = Run(faults);
+        EXPECT_TRUE(Content(earlier) == earlierContent);
         if (outcome.complete) {
             // The data was whole in the temporary file, only its tidier form found no room.
             EXPECT_EQ(ReadMovieFile(path_).pictures.size(), 100U);
-            EXPECT_EQ(folder_.Names(), std::vector<std::string>{"movie"});
+            EXPECT_EQ(folder_.Names(), (std::vector<std::string>{"earlier", "movie"}));
             std::filesystem::remove(path_);
             continue;
         }
         EXPECT_FALSE(std::filesystem::exists(path_));
-        EXPECT_EQ(outcome.status.nError, kWriterErrorNoSpace);
-        EXPECT_EQ(outcome.status.nSystemError, ENOSPC);
-        EXPECT_NE(std::string(outcome.status.szWhat), "");
+        EXPECT_EQ(outcome.status.nError,
+                  GetParam().error == ENOSPC ? kWriterErrorNoSpace : kWriterErrorWrite);
+        EXPECT_EQ(outcome.status.nSystemError, GetParam().error);
+        EXPECT_NE(std::string(outcome.status.szWhat).find(std::strerror(GetParam().error)),
+                  std::string::npos);
         if (!outcome.created) {
-            EXPECT_TRUE(folder_.Names().empty());
+            EXPECT_EQ(folder_.Names(), std::vector<std::string>{"earlier"});
             continue;
         }
         EXPECT_EQ(outcome.status.nState, kWriterFileFailed);
         ExpectPlayablePart(outcome, number);
         std::filesystem::remove(outcome.status.szTemporaryPath);
-        EXPECT_TRUE(folder_.Names().empty());
+        EXPECT_EQ(folder_.Names(), std::vector<std::string>{"earlier"});
     }
 }
 
-INSTANTIATE_TEST_SUITE_P(Formats, FaultIn,
-                         testing::Values(FourCC("MP4 "), FourCC("MKV "), FourCC("AVI "), FourCC("TS  ")),
-                         [](const auto& info) {
-                             return std::string(1, static_cast<char>(info.param & 0xFF)) +
-                                    static_cast<char>(info.param >> 8 & 0xFF);
-                         });
+INSTANTIATE_TEST_SUITE_P(
+    Disks, FaultIn,
+    testing::Values(Disk{"FullMp4", FourCC("MP4 "), ENOSPC}, Disk{"FullMkv", FourCC("MKV "), ENOSPC},
+                    Disk{"FullAvi", FourCC("AVI "), ENOSPC}, Disk{"FullTs", FourCC("TS  "), ENOSPC},
+                    Disk{"BrokenMp4", FourCC("MP4 "), EIO}, Disk{"BrokenMkv", FourCC("MKV "), EIO},
+                    Disk{"BarredMp4", FourCC("MP4 "), EACCES}, Disk{"BarredAvi", FourCC("AVI "), EACCES}),
+    [](const auto& info) { return info.param.name; });
 
 TEST_F(Fault, SyncAndRenameKeepTheDataUnderItsTemporaryName) {
     for (int Faults::*where : {&Faults::syncError, &Faults::renameError}) {
