@@ -8,6 +8,7 @@
 #include <algorithm>
 #include <chrono>
 #include <cmath>
+#include <filesystem>
 #include <fmt/format.h>
 
 namespace host {
@@ -17,6 +18,13 @@ constexpr double kTickSeconds = 0.5;
 constexpr std::chrono::seconds kSuspicious{2}; // between two ticks: the process was suspended
 constexpr double kMostPercent = 99.9;          // until the file has its name
 constexpr double kEarlyEnd = 1; // seconds by which a source may fall short of its announced length
+
+/// Whether the file is shorter than when it was opened.
+bool HasShrunk(const SourceInfo& source) {
+    std::error_code unknown;
+    const auto bytes = std::filesystem::file_size(source.path, unknown);
+    return !unknown && static_cast<int64_t>(bytes) < source.bytes;
+}
 
 WorkClock::Time Now() {
     return std::chrono::steady_clock::now();
@@ -68,6 +76,9 @@ ExitCode Conversion::Run() {
         0) {
         throw Failure(ExitCode::kInternal, "the conversion could not be started");
     }
+    if (MCWait(converter_.get(), 0) == 0 && !ended_) {
+        throw Failure(ExitCode::kInternal, "no thread could be started for the conversion");
+    }
     WaitForEnd();
     MCWait(converter_.get(), MC_INFINITE);
     return Conclude();
@@ -94,6 +105,7 @@ unsigned Conversion::OnProgress(void* context, unsigned kind, unsigned value, ui
         }
     }
     if (kind == 1) {
+        conversion->ended_ = true;
         PostHostEvent(EventKind::kFinished, value);
     }
     return 1;
@@ -106,6 +118,9 @@ void Conversion::WaitForEnd() {
         UpdateClock();
         if (received) {
             Handle(event);
+        }
+        if (!finished_ && WriterWatch::FileVanished()) {
+            Stop(); // whatever else were converted would be lost
         }
         if (!finished_) {
             ReportProgress();
@@ -255,7 +270,11 @@ std::optional<Failure> Conversion::Verdict() {
     if (files_.Complete() == 0) {
         return Failure(ExitCode::kInternal, fmt::format("no file was completed for \"{}\"", options_.output));
     }
-    if (const std::string reason = movie_.ReadError(); !reason.empty() && !userStopped_) {
+    std::string reason = movie_.ReadError();
+    if (reason.empty() && EndedEarly() && HasShrunk(movie_.Info())) {
+        reason = "the file was cut meanwhile";
+    }
+    if (!reason.empty() && !userStopped_) {
         return Failure(ExitCode::kCannotRead,
                        fmt::format("reading \"{}\" failed after {}: {}; what was read is converted",
                                    options_.input, FormatTime(options_.begin + position_, true), reason));
@@ -263,13 +282,16 @@ std::optional<Failure> Conversion::Verdict() {
     return std::nullopt;
 }
 
+bool Conversion::EndedEarly() const {
+    return outcome_ == kOutcomeCompleted && movie_.Info().durationKnown &&
+           length_ - std::max(position_.load(), movie_.SoundSeconds()) > kEarlyEnd;
+}
+
 void Conversion::ReportComplaints() {
     for (const std::string& complaint : movie_.Complaints()) {
         reporter_.Warning(fmt::format("\"{}\": {}", options_.input, complaint));
     }
-    const bool early = outcome_ == kOutcomeCompleted && movie_.Info().durationKnown &&
-                       length_ - std::max(position_.load(), movie_.SoundSeconds()) > kEarlyEnd;
-    if (early) {
+    if (EndedEarly()) {
         reporter_.Warning(fmt::format("\"{}\" ended after {} although it announces {}", options_.input,
                                       FormatTime(options_.begin + position_, true),
                                       FormatTime(movie_.Info().duration, true)));

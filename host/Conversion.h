@@ -55,6 +55,7 @@ private:
     void ReportProgress();
     ExitCode Conclude();
     std::optional<Failure> Verdict();
+    bool EndedEarly() const;
     void ReportComplaints();
 
     const Options& options_;
@@ -67,7 +68,9 @@ private:
     std::optional<Preview> preview_;
     Converter converter_;
 
-    std::atomic<double> position_{0}; // the engine's, in seconds
+    // The engine's worker sets these.
+    std::atomic<double> position_{0}; // in seconds
+    std::atomic<bool> ended_{false};
 
     WorkClock clock_;
     SpeedMeter speed_;

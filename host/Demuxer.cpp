@@ -80,8 +80,8 @@ bool Demuxer::KeyPictureAtOrBefore(int64_t mediaTime) {
 
 void Demuxer::Start() {
     if (!started_ && !stopping_) {
-        started_ = true;
         thread_ = std::thread(&Demuxer::Run, this);
+        started_ = true;
     }
 }
 
@@ -89,7 +89,9 @@ av::Packet Demuxer::Take(int stream) {
     std::unique_lock lock(mutex_);
     Start();
     Queue& queue = queues_.at(stream);
-    changed_.wait(lock, [&] { return stopping_ || ended_ || !queue.packets.empty(); });
+    WaitAndTell(
+        changed_, lock, [&] { return stopping_ || ended_ || !queue.packets.empty(); },
+        L"Movie::A decoder waits for the source");
     if (stopping_ || queue.packets.empty()) {
         return nullptr;
     }
@@ -108,6 +110,16 @@ void Demuxer::Stop() {
         stopping_ = true;
     }
     changed_.notify_all();
+}
+
+void Demuxer::Fail(const std::string& reason) {
+    {
+        const std::lock_guard lock(mutex_);
+        if (readError_.empty()) {
+            readError_ = reason;
+        }
+    }
+    Stop();
 }
 
 std::string Demuxer::ReadError() const {
@@ -133,19 +145,20 @@ bool Demuxer::HasEnough() const {
     return allFilled || bytes >= kEnoughBytes;
 }
 
+/// Waits until there is something to read for. False when there is nothing any more.
+bool Demuxer::AwaitDemand() {
+    std::unique_lock lock(mutex_);
+    WaitAndTell(
+        changed_, lock, [&] { return stopping_ || !HasEnough(); },
+        L"Movie::Reading the source waits for the decoders");
+    return !stopping_;
+}
+
 void Demuxer::Run() {
-    for (;;) {
-        {
-            std::unique_lock lock(mutex_);
-            changed_.wait(lock, [&] { return stopping_ || !HasEnough(); });
-            if (stopping_) {
-                break;
-            }
+    Attempt([this] {
+        while (AwaitDemand() && ReadOne()) {
         }
-        if (!ReadOne()) {
-            break;
-        }
-    }
+    });
     {
         const std::lock_guard lock(mutex_);
         ended_ = true;

@@ -7,12 +7,14 @@
 #define MOVIECONV_HOST_DEMUXER_H
 
 #include "host/Source.h"
+#include "thread/Stall.h"
 
 #include <condition_variable>
 #include <deque>
 #include <map>
 #include <mutex>
 #include <string>
+#include <system_error>
 #include <thread>
 
 namespace host {
@@ -35,6 +37,22 @@ public:
     /// Ends reading and wakes everyone who waits.
     void Stop();
 
+    /// Does a part of the work of reading and decoding. False when it threw, for want of memory or of
+    /// threads: then both streams end and ReadError tells why.
+    template <class Work>
+    bool Attempt(Work work) {
+        try {
+            work();
+            return true;
+        } catch (const std::system_error& failure) {
+            Fail(std::string("no thread can be started: ") + failure.what());
+            return false;
+        } catch (const std::exception& failure) {
+            Fail(failure.what());
+            return false;
+        }
+    }
+
     /// What ended the reading early; empty when it came to the end of the file.
     std::string ReadError() const;
 
@@ -49,6 +67,8 @@ private:
 
     void Start();
     void Run();
+    void Fail(const std::string& reason);
+    bool AwaitDemand();
     bool ReadOne();
     bool KeyPictureAtOrBefore(int64_t mediaTime);
     bool HasEnough() const;

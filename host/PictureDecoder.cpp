@@ -27,7 +27,9 @@ PictureDecoder::PictureDecoder(const Source& source, Demuxer& demuxer)
       decoder_(std::make_unique<StreamDecoder>(*stream_, 1)),
       converter_(source.Info().pictures->quarterTurns, source.Info().pictures->mirrored),
       stamps_(ToMediaTime(1 / source.Info().pictures->frameRate)),
-      queue_(kPicturesAhead, kBytesAhead) {
+      queue_(kPicturesAhead, kBytesAhead,
+             {L"Movie::The picture decoder waits for the conversion",
+              L"Movie::The conversion waits for the picture decoder"}) {
     const PictureStreamInfo& pictures = *source.Info().pictures;
     info_.format = {pictures.width, pictures.height, pictures.frameRate, pictures.duration};
     trial_.emplace();
@@ -51,8 +53,8 @@ double PictureDecoder::Seek(double seconds, int /*mode*/) {
 
 VideoImage* PictureDecoder::GetCurrentImage() {
     if (!ended_ && !current_.frame) {
-        thread_ = std::thread(&PictureDecoder::Run, this);
-        ended_ = !Advance();
+        ended_ =
+            !demuxer_.Attempt([this] { thread_ = std::thread(&PictureDecoder::Run, this); }) || !Advance();
     }
     return ended_ ? nullptr : &image_;
 }
@@ -88,10 +90,12 @@ bool PictureDecoder::Advance() {
 }
 
 void PictureDecoder::Run() {
-    DecodeAll();
-    if (const auto last = stamps_.Finish(); last && held_) {
-        Deliver(*last);
-    }
+    demuxer_.Attempt([this] {
+        DecodeAll();
+        if (const auto last = stamps_.Finish(); last && held_) {
+            Deliver(*last);
+        }
+    });
     repaired_ = stamps_.Repaired();
     damaged_ = damagedBefore_ + decoder_->Damaged();
     queue_.Finish();

@@ -44,8 +44,11 @@ SoundDecoder::SoundDecoder(const Source& source, Demuxer& demuxer)
       stream_(source.SoundStream()),
       decoder_(*stream_, 1),
       inputForm_(av_frame_alloc()),
-      queue_(1 << 12, static_cast<std::size_t>(source.Info().sound->sampleRate) *
-                          static_cast<std::size_t>(source.Info().sound->channels) * 4) {
+      queue_(1 << 12,
+             static_cast<std::size_t>(source.Info().sound->sampleRate) *
+                 static_cast<std::size_t>(source.Info().sound->channels) * 4,
+             {L"Movie::The sound decoder waits for the conversion",
+              L"Movie::The conversion waits for the sound decoder"}) {
     const SoundStreamInfo& sound = *source.Info().sound;
     frameBytes_ = static_cast<int64_t>(sound.channels) * sound.bitsPerSample / 8;
     blockBytes_ = BlockSamples(source.Info()) * frameBytes_;
@@ -80,8 +83,9 @@ double SoundDecoder::SecondsDelivered() const {
 }
 
 AudioFrame* SoundDecoder::GetNextFrame() {
-    if (!thread_.joinable()) {
-        thread_ = std::thread(&SoundDecoder::Run, this);
+    if (!thread_.joinable() &&
+        !demuxer_.Attempt([this] { thread_ = std::thread(&SoundDecoder::Run, this); })) {
+        return nullptr;
     }
     while (used_ == static_cast<int64_t>(current_.size())) {
         std::optional<Chunk> next = queue_.Pop();
@@ -112,6 +116,12 @@ AudioFrame* SoundDecoder::GetNextFrame() {
 
 void SoundDecoder::Run() {
     timeline_.emplace(info_.format.nSampleRate, begin_);
+    demuxer_.Attempt([this] { DecodeAll(); });
+    corrections_ = timeline_->Corrections();
+    queue_.Finish();
+}
+
+void SoundDecoder::DecodeAll() {
     const auto accept = [this](AVFrame& frame) { return Accept(frame); };
     bool goesOn = true;
     while (goesOn) {
@@ -122,8 +132,6 @@ void SoundDecoder::Run() {
     if (resampler_) {
         PushPlaced(std::nullopt, Resample(nullptr));
     }
-    corrections_ = timeline_->Corrections();
-    queue_.Finish();
 }
 
 bool SoundDecoder::Accept(const AVFrame& frame) {

@@ -39,6 +39,7 @@ private:
     using Chunk = std::vector<uint8_t>; // whole samples in the engine's form
 
     void Run();
+    void DecodeAll();
     bool Accept(const AVFrame& frame);
     bool FitResampler(const AVFrame& frame);
     Chunk Resample(const AVFrame* frame);

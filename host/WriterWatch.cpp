@@ -3,8 +3,10 @@
 #include "host/HostEvents.h"
 #include "host/OutputCheck.h"
 
+#include <cerrno>
 #include <chrono>
 #include <memory>
+#include <unistd.h>
 
 namespace host {
 namespace {
@@ -58,6 +60,18 @@ int64_t WriterWatch::Bytes() const {
     const bool open = MWGetFileStatus(MWGetFileCount(), status.get()) != 0 &&
                       (status->nState == kWriterFileWriting || status->nState == kWriterFileFinishing);
     return closedBytes_ + (open ? status->llBytesWritten : 0);
+}
+
+bool WriterWatch::FileVanished() {
+    const auto before = std::make_unique<WriterStatus>();
+    const auto after = std::make_unique<WriterStatus>();
+    const auto isWritten = [](WriterStatus& status) {
+        return MWGetFileStatus(MWGetFileCount(), &status) != 0 && status.nState == kWriterFileWriting &&
+               status.szTemporaryPath[0] != '\0';
+    };
+    // A close may give the file its name in between.
+    return isWritten(*before) && access(before->szTemporaryPath, F_OK) != 0 && errno == ENOENT &&
+           isWritten(*after) && before->nSequence == after->nSequence;
 }
 
 void WriterWatch::OnEvent(void* context, int event, const WriterStatus* status) {

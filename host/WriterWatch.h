@@ -34,6 +34,9 @@ public:
     /// Whether the writer waits for room on a full disk.
     bool WaitsForRoom() const { return waiting_; }
 
+    /// Whether the file that is being written has lost its place, by its own removal or the folder's.
+    static bool FileVanished();
+
     /// Ends that waiting: the file fails.
     void GiveUp();
 

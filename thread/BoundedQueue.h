@@ -3,6 +3,9 @@
 #ifndef MOVIECONV_THREAD_BOUNDEDQUEUE_H
 #define MOVIECONV_THREAD_BOUNDEDQUEUE_H
 
+#include "thread/Stall.h"
+
+#include <chrono>
 #include <condition_variable>
 #include <cstddef>
 #include <deque>
@@ -10,19 +13,28 @@
 #include <optional>
 #include <utility>
 
+/// How the two sides of a queue are named in the log when they wait for each other for long; see WaitAndTell.
+struct QueueSides {
+    const wchar_t* full;  ///< Who waits for room, and for whom.
+    const wchar_t* empty; ///< Who waits for an item, and for whom.
+    std::chrono::milliseconds limit = kStallLimit;
+};
+
 /// Items in the order they were pushed. All functions may be called on any thread.
 template <class Item>
 class BoundedQueue {
 public:
     /// At most `maxItems` items that weigh at most `maxWeight` together; a single item may weigh more.
-    BoundedQueue(std::size_t maxItems, std::size_t maxWeight) : maxItems_(maxItems), maxWeight_(maxWeight) {}
+    BoundedQueue(std::size_t maxItems, std::size_t maxWeight, QueueSides sides)
+        : maxItems_(maxItems), maxWeight_(maxWeight), sides_(sides) {}
     BoundedQueue(const BoundedQueue&) = delete;
     BoundedQueue& operator=(const BoundedQueue&) = delete;
 
     /// Waits for room. False when the queue was finished or closed: the item is gone.
     bool Push(Item item, std::size_t weight = 0) {
         std::unique_lock lock(mutex_);
-        changed_.wait(lock, [&] { return finished_ || HasRoom(weight); });
+        WaitAndTell(
+            changed_, lock, [&] { return finished_ || HasRoom(weight); }, sides_.full, sides_.limit);
         if (finished_) {
             return false;
         }
@@ -36,7 +48,8 @@ public:
     /// Waits for an item. Nothing once the queue is closed, or finished and empty.
     std::optional<Item> Pop() {
         std::unique_lock lock(mutex_);
-        changed_.wait(lock, [&] { return finished_ || !items_.empty(); });
+        WaitAndTell(
+            changed_, lock, [&] { return finished_ || !items_.empty(); }, sides_.empty, sides_.limit);
         if (items_.empty()) {
             return std::nullopt;
         }
@@ -80,6 +93,7 @@ private:
 
     const std::size_t maxItems_;
     const std::size_t maxWeight_;
+    const QueueSides sides_;
     mutable std::mutex mutex_;
     std::condition_variable changed_;
     std::deque<std::pair<Item, std::size_t>> items_;

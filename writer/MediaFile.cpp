@@ -6,6 +6,8 @@
 #include <algorithm>
 #include <cerrno>
 #include <cstring>
+#include <filesystem>
+#include <system_error>
 #include <utility>
 
 namespace writer {
@@ -78,12 +80,12 @@ MediaFile::MediaFile(const std::string& target, const EncodeParam& param, const 
     OpenPart();
     try {
         OpenStages();
+        StartPictures();
     } catch (...) {
         files_.Remove(partPath_);
         throw WriterFailure(Explain(std::current_exception()));
     }
     record_->SetTemporaryPath(partPath_);
-    StartPictures();
 }
 
 MediaFile::~MediaFile() = default;
@@ -167,6 +169,15 @@ bool MediaFile::WriteAudio(const AudioFrame& frame) {
     const PcmFormat format = FormatOf(frame);
     if (!sound_ || !format.Valid() || frame.pData == nullptr || frame.nLength <= 0 || record_->Failed())
         return false;
+    try {
+        return AddSound(frame, format);
+    } catch (...) {
+        Fail(std::current_exception());
+        return false;
+    }
+}
+
+bool MediaFile::AddSound(const AudioFrame& frame, const PcmFormat& format) {
     stamps_.AddSound(frame.llTime, frame.nLength, format.BytesPerSecond(), frame.nType == kMediaTypeSilence);
     record_->Update([&](WriterStatus& status) {
         status.llSamplesReceived += frame.nLength / format.BytesPerFrame();
@@ -217,12 +228,17 @@ WriterFailure MediaFile::Explain(const std::exception_ptr& error) const {
         std::rethrow_exception(error);
     } catch (const WriterFailure& failure) {
         return failure;
+    } catch (const std::system_error& failure) {
+        return {kWriterErrorInternal, std::string("No thread can be started: ") + failure.what() + ".",
+                failure.code().value()};
     } catch (const std::exception& failure) {
         return {kWriterErrorInternal, failure.what()};
     }
 }
 
 void MediaFile::Fail(const std::exception_ptr& error) {
+    if (std::error_code unknown; !std::filesystem::exists(partPath_, unknown) && !unknown)
+        record_->SetTemporaryPath(""); // the folder was removed meanwhile
     if (record_->Fail(Explain(error)))
         record_->Tell(kWriterEventFailed);
     CancelStages();
@@ -258,10 +274,14 @@ bool MediaFile::Close() {
 }
 
 void MediaFile::DrainStages() {
-    stamps_.Finish();
-    if (!waiting_.empty() && !record_->Failed()) {
-        StartSoundIfKnown();
-        PushSound();
+    try {
+        stamps_.Finish();
+        if (!waiting_.empty() && !record_->Failed()) {
+            StartSoundIfKnown();
+            PushSound();
+        }
+    } catch (...) {
+        Fail(std::current_exception());
     }
     if (pictures_)
         pictures_->Finish();

@@ -54,6 +54,7 @@ private:
     void OpenStages();
     void StartPictures();
     void StartSoundIfKnown();
+    bool AddSound(const AudioFrame& frame, const PcmFormat& format);
     bool PushSound();
     void Write(AVPacket& packet, int stream);
     void Fail(const std::exception_ptr& error);

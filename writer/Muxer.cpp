@@ -1,5 +1,6 @@
 #include "writer/Muxer.h"
 
+#include "thread/Stall.h"
 #include "writer/WriterFailure.h"
 #include "writer/WriterStatus.h"
 
@@ -89,8 +90,32 @@ void Muxer::WriteHeader() {
         SetDelays();
 }
 
+/// The right to use the multiplexer, which may write to the file for long.
+class Muxer::Turn {
+public:
+    explicit Turn(const Muxer& muxer) : muxer_(muxer) {
+        std::unique_lock lock(muxer.mutex_);
+        WaitAndTell(
+            muxer.changed_, lock, [&] { return !muxer.busy_; },
+            L"MediaWriter::A stream waits while another one is written to the file");
+        muxer.busy_ = true;
+    }
+    ~Turn() {
+        {
+            const std::lock_guard lock(muxer_.mutex_);
+            muxer_.busy_ = false;
+        }
+        muxer_.changed_.notify_one();
+    }
+    Turn(const Turn&) = delete;
+    Turn& operator=(const Turn&) = delete;
+
+private:
+    const Muxer& muxer_;
+};
+
 void Muxer::Write(AVPacket& packet, int stream) {
-    const std::lock_guard lock(mutex_);
+    const Turn turn(*this);
     State& state = streams_[static_cast<size_t>(stream)];
     const AVStream* out = output_->streams[stream];
     NoteTimes(state, packet);
@@ -111,14 +136,14 @@ void Muxer::Write(AVPacket& packet, int stream) {
 }
 
 void Muxer::WriteTrailer() {
-    const std::lock_guard lock(mutex_);
+    const Turn turn(*this);
     if (std::exchange(ended_, true))
         return;
     Check(av_write_trailer(output_.get()), "cannot be finished");
 }
 
 Muxer::Written Muxer::Stream(int stream) const {
-    const std::lock_guard lock(mutex_);
+    const Turn turn(*this);
     const State& state = streams_[static_cast<size_t>(stream)];
     const AVStream* out = output_->streams[stream];
     const int64_t length = state.endPts - state.firstPts - out->codecpar->initial_padding;

@@ -6,6 +6,7 @@
 #include "writer/AvioFile.h"
 #include "writer/FormatTable.h"
 
+#include <condition_variable>
 #include <cstdint>
 #include <mutex>
 #include <vector>
@@ -61,6 +62,8 @@ private:
         int64_t endPts = 0;
     };
 
+    class Turn;
+
     static void NoteTimes(State& state, const AVPacket& packet);
     void Check(int result, const char* what) const;
     void SetDelays();
@@ -69,7 +72,10 @@ private:
     const bool fragmented_;
     av::Output output_;
     av::Packet packet_;
-    mutable std::mutex mutex_; ///< Guards everything once the header is written.
+    mutable std::mutex mutex_;
+    mutable std::condition_variable changed_;
+    mutable bool busy_ =
+        false; ///< Whether one has its Turn; that guards everything once the header is written.
     std::vector<State> streams_;
     bool ended_ = false;
 };

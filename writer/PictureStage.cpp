@@ -37,7 +37,9 @@ PictureStage::PictureStage(const VideoPlan& plan, EncoderFlags flags)
       encoder_(*plan.codec, plan.settings, flags, plan.clock.ticksPerPicture),
       pacer_(plan.clock, plan.keepStamps),
       scaler_(plan.picture, plan.sourceAspect, plan.stretch, plan.sourceFullRange),
-      queue_(kMostPictures, kMostBytes) {}
+      queue_(kMostPictures, kMostBytes,
+             {L"MediaWriter::The conversion waits for the picture encoder",
+              L"MediaWriter::The picture encoder waits for the conversion"}) {}
 
 PictureStage::~PictureStage() {
     Cancel();

@@ -19,7 +19,9 @@ SoundStage::SoundStage(const AudioPlan& plan, EncoderFlags flags, bool fillsStar
     : fillsStart_(fillsStart),
       encoder_(*plan.codec, plan.settings, flags),
       converter_(Encoder().sample_rate, Encoder().ch_layout, Encoder().sample_fmt),
-      queue_(kMostBlocks, kMostBytes) {}
+      queue_(kMostBlocks, kMostBytes,
+             {L"MediaWriter::The conversion waits for the sound encoder",
+              L"MediaWriter::The sound encoder waits for the conversion"}) {}
 
 SoundStage::~SoundStage() {
     Cancel();

@@ -1,0 +1,147 @@
+// What befalls a conversion from outside: the input is cut or removed, the output's folder goes, threads
+// cannot be started, the log cannot be written. The program tells it by its exit code and leaves no half file
+// under a real name.
+#include "tests/host/Inspect.h"
+#include "tests/host/Program.h"
+#include "tests/host/TestMovies.h"
+
+#include <gtest/gtest.h>
+
+#include <chrono>
+#include <cstdlib>
+#include <filesystem>
+#include <fstream>
+#include <iterator>
+#include <sys/stat.h>
+#include <thread>
+
+namespace {
+
+namespace fs = std::filesystem;
+using namespace test_movies;
+using namespace inspect;
+using program::Call;
+using program::Result;
+using program::Running;
+using Args = std::vector<std::string>;
+
+/// A movie of 20 seconds that is much longer than what is read ahead: lightly compressed.
+std::string Long(const std::string& extension) {
+    return Make("long." + extension,
+                Join(Args{"-f", "lavfi", "-i", "testsrc2=size=640x360:rate=25:duration=20"}, Beeps(20),
+                     Args{"-c:v", "mpeg4", "-q:v", "2", "-g", "25", "-c:a", "aac"}));
+}
+
+std::size_t PicturesIn(const std::string& path) {
+    host::Movie movie(path, {});
+    return TakeAll(movie).pictures.size();
+}
+
+/// Converts to out/out.mp4 in `folder`; `harm` comes when the conversion has begun.
+template <class Harm>
+Result Convert(const std::string& source, const Folder& folder, Harm harm) {
+    fs::create_directory(folder / "out");
+    Running running({source, folder / "out/out.mp4", "--size", "960x720"}, true);
+    EXPECT_TRUE(running.WaitFor("0:00:01 / "));
+    harm();
+    return running.Finish();
+}
+
+TEST(InputFault, ACutFileIsToldAndWhatWasReadIsConverted) {
+    for (const std::string extension : {"mkv", "mp4"}) {
+        const Folder folder;
+        const std::string source = folder / ("in." + extension);
+        fs::copy_file(Long(extension), source);
+        const Result result =
+            Convert(source, folder, [&] { fs::resize_file(source, fs::file_size(source) / 2); });
+        EXPECT_EQ(result.code, 3) << result.out;
+        EXPECT_NE(result.out.find("reading \"" + source), std::string::npos) << result.out;
+        const std::size_t pictures = PicturesIn(folder / "out/out.mp4");
+        EXPECT_GT(pictures, 25u);
+        EXPECT_LT(pictures, 500u);
+    }
+}
+
+// An open file stays until it is closed.
+TEST(InputFault, ARemovedFileIsConvertedToItsEnd) {
+    const Folder folder;
+    const std::string source = folder / "in.mkv";
+    fs::copy_file(Long("mkv"), source);
+    const Result result = Convert(source, folder, [&] { fs::remove(source); });
+    EXPECT_EQ(result.code, 0) << result.out;
+    EXPECT_EQ(PicturesIn(folder / "out/out.mp4"), 500u);
+}
+
+TEST(OutputFault, ARemovedFolderEndsTheConversionSoon) {
+    const Folder folder;
+    const Result result = Convert(Long("mkv"), folder, [&] { fs::remove_all(folder / "out"); });
+    EXPECT_EQ(result.code, 4) << result.out;
+    EXPECT_NE(result.out.find("No such file or directory"), std::string::npos) << result.out;
+    EXPECT_EQ(result.out.find("is in \""), std::string::npos) << "nothing is left: " << result.out;
+    EXPECT_EQ(result.out.find("0:00:20 / "), std::string::npos) << "not all was converted for nothing";
+}
+
+TEST(LogFault, AFullOrMissingPlaceForTheLogIsNoHarm) {
+    const Folder folder;
+    const std::string source = Make("short.mkv", Join(CountedPictures(1), Beeps(1), Args{"-c:v", "mpeg4"}));
+    const Result full = Call({source, folder / "out.mp4", "--log", "/dev/full"});
+    EXPECT_EQ(full.code, 0) << full.err;
+    EXPECT_EQ(PicturesIn(folder / "out.mp4"), 25u);
+
+    const Result missing = Call({source, folder / "other.mp4", "--log", folder / "nowhere/log"});
+    EXPECT_EQ(missing.code, 4);
+    EXPECT_NE(missing.err.find("nowhere/log"), std::string::npos) << missing.err;
+    EXPECT_FALSE(fs::exists(folder / "other.mp4"));
+}
+
+// A source that delivers nothing for a while, and then goes on.
+TEST(LogFault, AStallIsNamed) {
+    const Folder folder;
+    const std::string source =
+        Make("stalling.ts", Join(CountedPictures(60), Args{"-c:v", "mpeg2video", "-q:v", "2"}));
+    ASSERT_EQ(mkfifo((folder / "in").c_str(), 0600), 0);
+    Running running({folder / "in", folder / "out.mp4", "--log", folder / "log", "--progress", "json"},
+                    false);
+    std::ifstream from(source, std::ios::binary);
+    const std::string bytes{std::istreambuf_iterator<char>(from), {}};
+    std::ofstream to(folder / "in", std::ios::binary);
+    const auto half = static_cast<std::streamsize>(bytes.size() / 2);
+    to.write(bytes.data(), half).flush();
+    const auto logged = [&](const char* line) {
+        std::ifstream log(folder / "log");
+        return std::string(std::istreambuf_iterator<char>(log), {}).find(line) != std::string::npos;
+    };
+    while (!logged("A decoder waits for the source for 5.") ||
+           !logged("The conversion waits for the picture decoder for 5."))
+        std::this_thread::sleep_for(std::chrono::milliseconds(20));
+    to.write(bytes.data() + half, static_cast<std::streamsize>(bytes.size()) - half);
+    to.close();
+    EXPECT_EQ(running.Finish().code, 0);
+    EXPECT_TRUE(logged("A decoder waits for the source no longer, after "));
+}
+
+#ifdef MOVIECONV_FAILING_THREADS
+// The threads of the program, the engine, the decoders and the writer, in the order of their start. The first
+// run in which all start ends the loop.
+TEST(ThreadFault, EveryThreadThatCannotBeStartedIsTold) {
+    const std::string source = Make("short.mkv", Join(CountedPictures(1), Beeps(1), Args{"-c:v", "mpeg4"}));
+    for (int number = 1;; ++number) {
+        SCOPED_TRACE(number);
+        const Folder folder;
+        setenv("MOVIECONV_FAILING_THREAD", std::to_string(number).c_str(), 1);
+        setenv("LD_PRELOAD", MOVIECONV_FAILING_THREADS, 1);
+        const Result result = Call({source, folder / "out.mp4", "--preview", folder / "now.png"});
+        unsetenv("LD_PRELOAD");
+        if (result.code == 0) {
+            EXPECT_EQ(PicturesIn(folder / "out.mp4"), 25u);
+            EXPECT_GE(number, 9) << "keys, preview, worker, decoders, reading, encoders";
+            return;
+        }
+        EXPECT_TRUE(result.code == 1 || result.code == 3) << result.code;
+        EXPECT_NE(result.err, "");
+        EXPECT_TRUE(result.code == 3 || !fs::exists(folder / "out.mp4")) << result.err;
+    }
+}
+#endif
+
+} // namespace

@@ -1,0 +1,173 @@
+// MCStop and MCAbort from every state: what holds the worker is let go once the stop has been asked for, and
+// then MCStop comes back. How long that takes is printed, never judged.
+#include "api/MovieConv.h"
+#include "tests/engine/IdleParts.h"
+#include "tests/recorder/RecordingWriter.h"
+
+#include <gtest/gtest.h>
+
+#include <atomic>
+#include <chrono>
+#include <condition_variable>
+#include <cstdio>
+#include <mutex>
+#include <thread>
+#include <vector>
+
+namespace {
+
+/// Holds who passes while it is shut.
+class Gate {
+public:
+    void Pass() {
+        std::unique_lock lock(mutex_);
+        held_ = shut_;
+        changed_.notify_all();
+        changed_.wait(lock, [&] { return !shut_; });
+        held_ = false;
+    }
+    void Shut() {
+        const std::lock_guard lock(mutex_);
+        shut_ = true;
+    }
+    void Open() {
+        const std::lock_guard lock(mutex_);
+        shut_ = false;
+        changed_.notify_all();
+    }
+    void AwaitHeld() {
+        std::unique_lock lock(mutex_);
+        changed_.wait(lock, [&] { return held_; });
+    }
+
+private:
+    std::mutex mutex_;
+    std::condition_variable changed_;
+    bool shut_ = false;
+    bool held_ = false;
+};
+
+Gate g_picture;
+Gate g_sound;
+Gate g_callback;
+Gate g_close;
+
+class GatedVideo : public IdleVideo {
+public:
+    using IdleVideo::IdleVideo;
+    int DecodeNext(int mode) override {
+        g_picture.Pass();
+        return IdleVideo::DecodeNext(mode);
+    }
+};
+
+class GatedAudio : public IdleAudio {
+public:
+    using IdleAudio::IdleAudio;
+    AudioFrame* GetNextFrame() override {
+        g_sound.Pass();
+        return IdleAudio::GetNextFrame();
+    }
+};
+
+void Nothing() {}
+
+struct State {
+    const char* name;
+    void (*hold)();          // before the start
+    void (*enter)(MCHandle); // waits until the worker is there
+    void (*release)();
+    int64_t pictures = 1'000'000;
+    unsigned outcome = kOutcomeStopped;
+};
+
+template <Gate& gate>
+State HeldBy(const char* name) {
+    return {name, [] { gate.Shut(); }, [](MCHandle) { gate.AwaitHeld(); }, [] { gate.Open(); }};
+}
+
+std::vector<State> States() {
+    State inTheClose = HeldBy<g_close>("InTheClose");
+    inTheClose.pictures = 100;
+    inTheClose.outcome = kOutcomeCompleted;
+    return {
+        {"Running", Nothing, [](MCHandle) {}, Nothing},
+        {"Paused", Nothing, [](MCHandle handle) { MCPause(handle); }, Nothing},
+        {"InTheWriter", recorder::Block, [](MCHandle) { recorder::WaitUntilBlocked(); }, recorder::Unblock},
+        HeldBy<g_picture>("InThePictureDecoder"),
+        HeldBy<g_sound>("InTheSoundDecoder"),
+        HeldBy<g_callback>("InTheCallback"),
+        inTheClose};
+}
+
+class StopFrom : public testing::TestWithParam<State> {
+protected:
+    StopFrom() {
+        recorder::Reset();
+        recorder::OnClose([] { g_close.Pass(); });
+    }
+    ~StopFrom() override {
+        recorder::Reset();
+        MCDestroy(handle_);
+    }
+
+    void StartAndEnter() {
+        GetParam().hold();
+        ASSERT_EQ(MCStart(handle_, 0.0, 0.0, nullptr, Callback, this), 0);
+        GetParam().enter(handle_);
+    }
+
+    static bool IsHeld() { return GetParam().release != Nothing; }
+
+    static unsigned Callback(void* context, unsigned kind, unsigned value, uintptr_t) {
+        if (kind == 1)
+            static_cast<StopFrom*>(context)->outcome_ = value;
+        else
+            g_callback.Pass();
+        return 1;
+    }
+
+    GatedVideo video_{GetParam().pictures};
+    GatedAudio audio_{2 * GetParam().pictures};
+    MCHandle handle_ = MCCreate(&video_, &audio_);
+    std::atomic<unsigned> outcome_{99};
+};
+
+TEST_P(StopFrom, ComesBack) {
+    StartAndEnter();
+    std::atomic<bool> back{false};
+    std::chrono::steady_clock::time_point returned;
+    std::thread stopper([&] {
+        MCStop(handle_);
+        returned = std::chrono::steady_clock::now();
+        back = true;
+    });
+    while (!back && MCPause(handle_) != 0) // 0 once the stop has been asked for
+        MCResume(handle_);
+    if (IsHeld()) {
+        EXPECT_FALSE(back) << "the worker is held";
+    }
+    const auto released = std::chrono::steady_clock::now();
+    GetParam().release();
+    stopper.join();
+    std::printf("MCStop came back %.1f ms after nothing held the worker any more\n",
+                std::chrono::duration<double, std::milli>(returned - released).count());
+    EXPECT_EQ(MCWait(handle_, 0), 0);
+    EXPECT_EQ(outcome_, GetParam().outcome);
+}
+
+TEST_P(StopFrom, AbortDoesNotWait) {
+    StartAndEnter();
+    EXPECT_EQ(MCAbort(handle_), 1);
+    if (IsHeld()) {
+        EXPECT_EQ(MCWait(handle_, 0), MC_WAIT_TIMEOUT) << "the worker is held";
+    }
+    GetParam().release();
+    EXPECT_EQ(MCWait(handle_, MC_INFINITE), 0);
+    EXPECT_EQ(outcome_, GetParam().outcome);
+}
+
+INSTANTIATE_TEST_SUITE_P(States, StopFrom, testing::ValuesIn(States()),
+                         [](const auto& info) { return info.param.name; });
+
+} // namespace
