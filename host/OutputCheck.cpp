@@ -42,6 +42,10 @@ void CheckTarget(const std::string& path, const struct stat* input, const Option
     if (S_ISDIR(target.st_mode)) {
         throw Failure(ExitCode::kCannotWrite, fmt::format("\"{}\" is a folder; name a file in it", path));
     }
+    if (!S_ISREG(target.st_mode)) {
+        throw Failure(ExitCode::kCannotWrite,
+                      fmt::format("\"{}\" is not a file but a device or a pipe; name a file", path));
+    }
     if (!options.overwrite) {
         throw Failure(ExitCode::kCannotWrite,
                       fmt::format("\"{}\" exists; use another name or --overwrite", path));
@@ -114,7 +118,7 @@ std::string FolderOf(const std::string& path) {
 
 int64_t FreeBytes(const std::string& folder) {
     struct statvfs status {};
-    if (statvfs(folder.c_str(), &status) != 0) {
+    if (statvfs(folder.c_str(), &status) != 0 || status.f_blocks == 0) {
         return -1;
     }
     return static_cast<int64_t>(status.f_bavail) * static_cast<int64_t>(status.f_frsize);

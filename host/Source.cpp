@@ -4,7 +4,7 @@
 
 #include <algorithm>
 #include <cmath>
-#include <sys/stat.h>
+#include <system_error>
 
 extern "C" {
 #include <libavutil/display.h>
@@ -19,8 +19,12 @@ constexpr double kGuessedDuration = 3600; // for sources that tell nothing at al
 constexpr double kHighestFrameRate = 200; // rates above are artefacts of the container's clock
 constexpr AVRational kFallbackFrameRate{25, 1};
 
-int WasInterrupted(void* flag) {
-    return *static_cast<std::atomic<bool>*>(flag) ? 1 : 0;
+int WasInterrupted(void* file) {
+    return static_cast<const InputFile*>(file)->Interrupted() ? 1 : 0;
+}
+
+std::string CannotOpen(const std::string& path, const std::string& reason) {
+    return "cannot open \"" + path + "\": " + reason;
 }
 
 bool IsPlausible(AVRational rate) {
@@ -92,15 +96,18 @@ Source::Source(const std::string& path, SourceChoice choice) {
 }
 
 void Source::Open(const std::string& path) {
-    struct stat status {};
-    if (stat(path.c_str(), &status) == 0 && S_ISREG(status.st_mode)) {
-        info_.bytes = status.st_size;
+    try {
+        file_ = std::make_unique<InputFile>(path);
+    } catch (const std::system_error& error) {
+        throw SourceError(CannotOpen(path, error.code().message()));
     }
+    info_.bytes = file_->Size();
     AVFormatContext* context = avformat_alloc_context();
     if (context == nullptr) {
         throw std::bad_alloc();
     }
-    context->interrupt_callback = {WasInterrupted, &interrupted_};
+    context->pb = file_->Io();
+    context->interrupt_callback = {WasInterrupted, file_.get()}; // for files that the source names
     // The prefix keeps a colon in the name from being read as a protocol.
     const int result = avformat_open_input(&context, ("file:" + path).c_str(), nullptr, nullptr);
     if (result < 0) {
@@ -108,7 +115,7 @@ void Source::Open(const std::string& path) {
             result == AVERROR_INVALIDDATA
                 ? "it is not a movie, or its index is missing because it was never finished"
                 : av::ErrorText(result);
-        throw SourceError("cannot open \"" + path + "\": " + hint);
+        throw SourceError(CannotOpen(path, hint));
     }
     input_.reset(context);
     if (const int found = avformat_find_stream_info(context, nullptr); found < 0) {

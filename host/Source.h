@@ -3,9 +3,10 @@
 #define MOVIECONV_HOST_SOURCE_H
 
 #include "ffmpeg/AvHandles.h"
+#include "host/InputFile.h"
 
-#include <atomic>
 #include <cstdint>
+#include <memory>
 #include <optional>
 #include <stdexcept>
 #include <string>
@@ -80,7 +81,7 @@ public:
     int64_t MediaTime(int64_t stamp, const AVStream* stream) const;
 
     /// Makes every read fail from now on, also one that is under way.
-    void Interrupt() { interrupted_ = true; }
+    void Interrupt() { file_->Interrupt(); }
 
 private:
     void Open(const std::string& path);
@@ -90,7 +91,7 @@ private:
     void FindDuration();
     double LastStampSeconds();
 
-    std::atomic<bool> interrupted_{false};
+    std::unique_ptr<InputFile> file_;
     av::Input input_;
     int64_t start_ = 0; // the container's first stamp, in media time
     SourceInfo info_;

@@ -8,6 +8,7 @@
 #include <iterator>
 #include <pty.h>
 #include <sys/wait.h>
+#include <termios.h>
 #include <unistd.h>
 
 namespace program {
@@ -106,6 +107,16 @@ bool Running::WaitFor(const std::string& text) {
             return false;
         }
     }
+}
+
+bool Running::WaitUntilSuspended() const {
+    int status = 0;
+    return waitpid(child_, &status, WUNTRACED) == child_ && WIFSTOPPED(status);
+}
+
+bool Running::Echoes() const {
+    termios settings{};
+    return tcgetattr(output_, &settings) == 0 && (settings.c_lflag & ECHO) != 0;
 }
 
 void Running::Signal(int signal) const {

@@ -29,6 +29,12 @@ public:
     /// Reads what it prints until `text` has come once more since the last call. False when it ended before.
     bool WaitFor(const std::string& text);
 
+    /// False when it ended instead.
+    bool WaitUntilSuspended() const;
+
+    /// Whether its terminal shows what is typed, as it does without the program.
+    bool Echoes() const;
+
     void Signal(int signal) const;
     void Press(const std::string& keys) const;
     Result Finish();
