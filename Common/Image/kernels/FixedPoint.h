@@ -8,33 +8,42 @@
 namespace image {
 
 /// RGB to YUV. A sum is scaled by 2^16 / 2^kBits, so that the result is the upper half of a 32-bit lane,
-/// rounded toward minus infinity: no shift, and nothing of the fraction left to carry. Red and blue are
-/// weighted as one pair of words, green as a pair of equal words, because its scaled weight alone would not
-/// fit 16 bits.
-///   Y - 16 = (blue * B + red * R + green * G + green * G + rounding) >> 16, and so on.
-/// The weights of U add up to 0, so U needs only B - G and R - G. Those of V add up to kCrSum, so that times
-/// G is missing.
+/// rounded toward minus infinity: no shift, and nothing of the fraction left to carry. A pixel is the bytes
+/// B, R, G, R: byte weights make two words of them, and word weights the sum of these. The inner and outer
+/// weights are factors of the scaled ones, chosen so that red, which stands in both words, gets its own:
+///   Y - 16 = (outerBlue * (innerBlue * B + besideBlue * R)
+///             + outerGreen * (innerGreen * G + besideGreen * R) + rounding) >> 16.
+/// The weights of U add up to 0, so U needs only B - R and G - R. Those of V add up to kCrSum, so that times
+/// R is missing.
 template <int kBitsOfSet, int kYRed, int kYGreen, int kYBlue, int kCbRed, int kCbGreen, int kCbBlue,
-          int kCrRed, int kCrGreen, int kCrBlue, int kRoundingOfSet>
+          int kCrRed, int kCrGreen, int kCrBlue, int kRoundingOfSet, int kInnerBlue, int kBesideBlue,
+          int kInnerGreen, int kBesideGreen>
 struct RgbToYuvForm {
     static constexpr int kScale = 1 << (16 - kBitsOfSet);
-    static constexpr int kYBlueWeight = kYBlue * kScale;
-    static constexpr int kYRedWeight = kYRed * kScale;
-    static constexpr int kYGreenWeight = kYGreen * kScale / 2;
+    static constexpr int kYInnerBlue = kInnerBlue;
+    static constexpr int kYBesideBlue = kBesideBlue;
+    static constexpr int kYInnerGreen = kInnerGreen;
+    static constexpr int kYBesideGreen = kBesideGreen;
+    static constexpr int kYOuterBlue = kYBlue * kScale / kInnerBlue;
+    static constexpr int kYOuterGreen = kYGreen * kScale / kInnerGreen;
     static constexpr int kCbBlueWeight = kCbBlue * kScale;
-    static constexpr int kCbRedWeight = kCbRed * kScale;
+    static constexpr int kCbGreenWeight = kCbGreen * kScale;
     static constexpr int kCrBlueWeight = kCrBlue * kScale;
-    static constexpr int kCrRedWeight = kCrRed * kScale;
+    static constexpr int kCrGreenWeight = kCrGreen * kScale;
     static constexpr int kCrSum = (kCrRed + kCrGreen + kCrBlue) * kScale;
     static constexpr int kRounding = kRoundingOfSet * kScale;
 
+    static_assert(kYOuterBlue * kInnerBlue == kYBlue * kScale);
+    static_assert(kYOuterGreen * kInnerGreen == kYGreen * kScale);
+    static_assert(kYOuterBlue * kBesideBlue + kYOuterGreen * kBesideGreen == kYRed * kScale);
+    static_assert(kYOuterBlue <= INT16_MAX && kYOuterGreen <= INT16_MAX);
     static_assert(kCbRed + kCbGreen + kCbBlue == 0);
-    static_assert(kYGreenWeight <= INT16_MAX && kYRedWeight <= INT16_MAX && kCbBlueWeight <= INT16_MAX);
-    static_assert(kCrRedWeight <= INT16_MAX);
+    static_assert(kCbBlueWeight <= INT16_MAX && kCrGreenWeight >= INT16_MIN);
 };
 
-using FastRgbForm = RgbToYuvForm<14, 4211, 8258, 1606, -2425, -4768, 7193, 7193, -6029, -1163, 0>;
-using SimpleRgbForm = RgbToYuvForm<10, 263, 516, 100, -152, -298, 450, 450, -377, -73, 512>;
+using FastRgbForm =
+    RgbToYuvForm<14, 4211, 8258, 1606, -2425, -4768, 7193, 7193, -6029, -1163, 0, 11, -56, 2, 3>;
+using SimpleRgbForm = RgbToYuvForm<10, 263, 516, 100, -152, -298, 450, 450, -377, -73, 512, 1, -58, 4, 47>;
 
 /// YUV to RGB in 16-bit lanes: component = clamp((luma + chroma) >> 7) with
 ///   luma = 149 * Y - kBias and chroma = the term of the equation >> (its bits - 7), + kBias.

@@ -24,8 +24,6 @@ namespace image {
 /// The contents of one lane, repeated in all.
 using LaneBytes = std::array<int8_t, 16>;
 
-constexpr int8_t kZero = -128; // as a shuffle index: a zero byte
-
 template <class V>
 class LaneKernels {
     using Vec = typename V::Vec;
@@ -64,62 +62,68 @@ class LaneKernels {
     // --- RGB to YUV
     // --------------------------------------------------------------------------------------------------
 
-    /// Sixteen pixels a lane as four vectors of four pixels each: the words (B, R) and (G, G) of every pixel.
-    struct Pixels {
-        Vec blueRed[4];
-        Vec green[4];
+    /// Four bytes for every 32 bits, the first lowest.
+    static Vec SetBytes(int first, int second, int third, int fourth) {
+        return V::Set32((first & 0xFF) | (second & 0xFF) << 8 | (third & 0xFF) << 16 |
+                        static_cast<int>(static_cast<unsigned>(fourth) << 24));
+    }
+
+    /// Sixteen pixels a lane as four vectors of four pixels each.
+    struct Quads {
+        Vec part[4];
     };
+
+    /// Indices that make B, R, G, R of four pixels of kBytes each, the first of which begins at `start`.
+    template <int kBytes>
+    static constexpr LaneBytes BlueRedGreenRed(int start) {
+        constexpr int kOrder[4] = {0, 2, 1, 2};
+        LaneBytes indices{};
+        for (int i = 0; i < 16; ++i)
+            indices[static_cast<size_t>(i)] = static_cast<int8_t>(start + i / 4 * kBytes + kOrder[i % 4]);
+        return indices;
+    }
 
     struct Bgr32 {
         static constexpr ptrdiff_t kBytes = 4;
 
-        static Vec LoadQuad(const uint8_t* p, int quad) { return V::LoadLanes(p + 16 * quad, 64); }
+        static Quads Load(const uint8_t* p) {
+            Quads bytes;
+            for (int i = 0; i < 4; ++i)
+                bytes.part[i] = V::LoadLanes(p + 16 * i, 64);
+            return bytes;
+        }
 
-        static Pixels Load(const uint8_t* p) {
-            constexpr LaneBytes kGreen{1, kZero, 1, kZero, 5,  kZero, 5,  kZero,
-                                       9, kZero, 9, kZero, 13, kZero, 13, kZero};
-            Pixels pixels;
-            for (int quad = 0; quad < 4; ++quad) {
-                const Vec bgrx = LoadQuad(p, quad);
-                pixels.blueRed[quad] = V::And(bgrx, V::Set32(0x00FF00FF));
-                pixels.green[quad] = V::Shuffle8(bgrx, V::Lane(kGreen));
-            }
+        static Quads Pixels(const Quads& bytes) {
+            constexpr LaneBytes kOrder = BlueRedGreenRed<kBytes>(0);
+            Quads pixels;
+            for (int i = 0; i < 4; ++i)
+                pixels.part[i] = V::Shuffle8(bytes.part[i], V::Lane(kOrder));
             return pixels;
         }
 
-        static Vec Alpha(const uint8_t* p) {
-            Vec alpha[4];
-            for (int quad = 0; quad < 4; ++quad)
-                alpha[quad] = V::template Srl32<8>(LoadQuad(p, quad));
-            return PackUpperHalves(alpha);
+        static Vec Alpha(const Quads& bytes) {
+            const auto alpha = [&](int i) { return V::template Srl32<24>(bytes.part[i]); };
+            return V::PackUs16(V::PackS32(alpha(0), alpha(1)), V::PackS32(alpha(2), alpha(3)));
         }
     };
 
     struct Bgr24 {
         static constexpr ptrdiff_t kBytes = 3;
 
-        static constexpr LaneBytes Indices(int first, int second) {
-            LaneBytes indices{};
-            for (size_t i = 0; i < 16; ++i) {
-                const int component = i % 4 == 0 ? first : second;
-                indices[i] =
-                    static_cast<int8_t>(i % 2 != 0 ? kZero : 3 * static_cast<int>(i / 4) + component);
-            }
-            return indices;
-        }
-
-        static Pixels Load(const uint8_t* p) {
+        static Quads Load(const uint8_t* p) {
             // Four pixels are 12 of the 16 bytes loaded. The last four are loaded from 4 bytes before them,
             // so that no byte behind the block is read.
-            Pixels pixels;
-            for (int quad = 0; quad < 3; ++quad) {
-                const Vec bgr = V::LoadLanes(p + 12 * quad, 48);
-                pixels.blueRed[quad] = V::Shuffle8(bgr, V::Lane(Indices(0, 2)));
-                pixels.green[quad] = V::Shuffle8(bgr, V::Lane(Indices(1, 1)));
-            }
-            const Vec bgr = V::LoadLanes(p + 32, 48);
-            pixels.blueRed[3] = V::Shuffle8(bgr, V::Lane(Indices(4, 6)));
-            pixels.green[3] = V::Shuffle8(bgr, V::Lane(Indices(5, 5)));
+            return {{V::LoadLanes(p, 48), V::LoadLanes(p + 12, 48), V::LoadLanes(p + 24, 48),
+                     V::LoadLanes(p + 32, 48)}};
+        }
+
+        static Quads Pixels(const Quads& bytes) {
+            constexpr LaneBytes kOrder = BlueRedGreenRed<kBytes>(0);
+            constexpr LaneBytes kOrderLater = BlueRedGreenRed<kBytes>(4);
+            Quads pixels;
+            for (int i = 0; i < 3; ++i)
+                pixels.part[i] = V::Shuffle8(bytes.part[i], V::Lane(kOrder));
+            pixels.part[3] = V::Shuffle8(bytes.part[3], V::Lane(kOrderLater));
             return pixels;
         }
     };
@@ -127,14 +131,6 @@ class LaneKernels {
     /// The words of a's upper halves and b's, alternating.
     static Vec MergeUpperHalves(Vec a, Vec b) {
         return V::template Blend16<0xAA>(V::template Srl32<16>(a), b);
-    }
-
-    /// The bytes that stand in the upper halves of four quads, in the order of the pixels.
-    static Vec PackUpperHalves(const Vec (&quads)[4]) {
-        constexpr LaneBytes kOrder{0, 2, 4, 6, 1, 3, 5, 7, 8, 10, 12, 14, 9, 11, 13, 15};
-        const Vec bytes =
-            V::PackUs16(MergeUpperHalves(quads[0], quads[1]), MergeUpperHalves(quads[2], quads[3]));
-        return V::Shuffle8(bytes, V::Lane(kOrder));
     }
 
     template <class Form>
@@ -145,82 +141,88 @@ class LaneKernels {
             return sums;
     }
 
+    /// Y of pixels given as B, R, G, R.
     template <class Form>
-    static Vec Luma(const Pixels& pixels) {
-        const Vec blueRedWeights = V::SetPair(Form::kYBlueWeight, Form::kYRedWeight);
-        const Vec greenWeights = V::Set16(Form::kYGreenWeight);
+    static Vec Luma(const Quads& pixels) {
+        constexpr LaneBytes kOrder{0, 2, 4, 6, 1, 3, 5, 7, 8, 10, 12, 14, 9, 11, 13, 15};
+        const Vec inner =
+            SetBytes(Form::kYInnerBlue, Form::kYBesideBlue, Form::kYInnerGreen, Form::kYBesideGreen);
+        const Vec outer = V::SetPair(Form::kYOuterBlue, Form::kYOuterGreen);
         Vec sums[4];
-        for (int quad = 0; quad < 4; ++quad)
-            sums[quad] = Rounded<Form>(V::Add32(V::MulAdd16(pixels.blueRed[quad], blueRedWeights),
-                                                V::MulAdd16(pixels.green[quad], greenWeights)));
-        return V::Add8(PackUpperHalves(sums), V::Set8(16));
+        for (int i = 0; i < 4; ++i)
+            sums[i] = Rounded<Form>(V::MulAdd16(V::MulAddU8S8(pixels.part[i], inner), outer));
+        const Vec luma = V::PackUs16(MergeUpperHalves(sums[0], sums[1]), MergeUpperHalves(sums[2], sums[3]));
+        return V::Add8(V::Shuffle8(luma, V::Lane(kOrder)), V::Set8(16));
     }
 
-    /// Centred Cb and Cr of sixteen pixels a lane, in words: quad 0 and 1 alternating, then quad 2 and 3.
-    struct Chroma {
-        Vec cb[2];
-        Vec cr[2];
-    };
-
+    /// Centred Cb and Cr of such pixels, in alternating words.
     template <class Form>
-    static Chroma PixelChroma(const Pixels& pixels) {
-        const Vec cbWeights = V::SetPair(Form::kCbBlueWeight, Form::kCbRedWeight);
-        const Vec crWeights = V::SetPair(Form::kCrBlueWeight, Form::kCrRedWeight);
-        Vec cb[4];
-        Vec cr[4];
-        for (int quad = 0; quad < 4; ++quad) {
-            const Vec difference = V::Sub16(pixels.blueRed[quad], pixels.green[quad]);
-            cb[quad] = Rounded<Form>(V::MulAdd16(difference, cbWeights));
-            cr[quad] = Rounded<Form>(V::MulAdd16(difference, crWeights));
+    static Quads PixelChroma(const Quads& pixels) {
+        const Vec cbWeights = V::SetPair(Form::kCbBlueWeight, Form::kCbGreenWeight);
+        const Vec crWeights = V::SetPair(Form::kCrBlueWeight, Form::kCrGreenWeight);
+        Quads chroma;
+        for (int i = 0; i < 4; ++i) {
+            const Vec differences = V::MulAddU8S8(pixels.part[i], SetBytes(1, -1, 1, -1));
+            const Vec cb = Rounded<Form>(V::MulAdd16(differences, cbWeights));
+            Vec cr = Rounded<Form>(V::MulAdd16(differences, crWeights));
             if constexpr (Form::kCrSum != 0) {
-                static_assert(Form::kCrSum == 4);
-                cr[quad] =
-                    V::Add32(cr[quad], V::template Srl32<14>(pixels.green[quad])); // G << 16 becomes 4 G
+                // 4 R, and of G what is less than the step of a sum
+                static_assert(Form::kCrSum == 4 && Form::kScale == 4);
+                cr = V::Add32(cr, V::template Srl32<22>(pixels.part[i]));
             }
+            chroma.part[i] = MergeUpperHalves(cb, cr);
         }
-        return {{MergeUpperHalves(cb[0], cb[1]), MergeUpperHalves(cb[2], cb[3])},
-                {MergeUpperHalves(cr[0], cr[1]), MergeUpperHalves(cr[2], cr[3])}};
+        return chroma;
     }
 
-    static Chroma AddRows(const Chroma& a, const Chroma& b) {
-        return {{V::Add16(a.cb[0], b.cb[0]), V::Add16(a.cb[1], b.cb[1])},
-                {V::Add16(a.cr[0], b.cr[0]), V::Add16(a.cr[1], b.cr[1])}};
+    static Quads AddRows(const Quads& a, const Quads& b) {
+        Quads sums;
+        for (int i = 0; i < 4; ++i)
+            sums.part[i] = V::Add16(a.part[i], b.part[i]);
+        return sums;
     }
 
-    /// The sums of neighbouring pixels: eight words, of the pairs 0, 2, 4, 6, 1, 3, 5, 7.
-    static Vec PairSums(const Vec (&words)[2]) {
-        const Vec first = V::Add16(words[0], V::template Srl64<32>(words[0]));
-        const Vec second = V::Add16(words[1], V::template Sll64<32>(words[1]));
-        return V::template Blend16<0xCC>(first, second);
-    }
-
-    /// U of the pairs as above, then V: averages of kPixelsOfBlock = 1 << kLog2 values, with the offset of
-    /// 128.
+    /// U and V in alternating bytes: averages of 1 << kLog2 values of neighbours.
     template <int kLog2>
-    static Vec StoredChroma(const Chroma& chroma) {
-        const Vec offset = V::Set16(128 << kLog2);
-        return V::PackUs16(V::template Srl16<kLog2>(V::Add16(PairSums(chroma.cb), offset)),
-                           V::template Srl16<kLog2>(V::Add16(PairSums(chroma.cr), offset)));
+    static Vec StoredChroma(const Quads& chroma) {
+        const auto averages = [](Vec a, Vec b) {
+            return V::template Sra16<kLog2>(V::Add16(V::EvenDwords(a, b), V::OddDwords(a, b)));
+        };
+        return V::Add8(
+            V::PackS16(averages(chroma.part[0], chroma.part[1]), averages(chroma.part[2], chroma.part[3])),
+            V::Set8(-128));
     }
 
-    template <class Format, class Form>
-    static void RgbBlockTo420(RowPair<uint8_t> y, uint8_t* u, uint8_t* v, RowPair<const uint8_t> rgb) {
-        constexpr LaneBytes kOrder{0, 4, 1, 5, 2, 6, 3, 7, 8, 12, 9, 13, 10, 14, 11, 15};
-        const Pixels first = Format::Load(rgb.first);
-        V::Store(y.first, Luma<Form>(first));
-        const Chroma firstChroma = PixelChroma<Form>(first);
-        const Pixels second = Format::Load(rgb.second);
-        V::Store(y.second, Luma<Form>(second));
-        const Chroma chroma = AddRows(firstChroma, PixelChroma<Form>(second));
-        V::StoreHalves(u, v, V::Shuffle8(StoredChroma<2>(chroma), V::Lane(kOrder)));
+    /// Stores bytes that alternate between two planes.
+    static void StoreAlternating(uint8_t* even, uint8_t* odd, Vec bytes) {
+        constexpr LaneBytes kApart{0, 2, 4, 6, 8, 10, 12, 14, 1, 3, 5, 7, 9, 11, 13, 15};
+        V::StoreHalves(even, odd, V::ExchangeMiddle(V::Shuffle8(bytes, V::Lane(kApart))));
+    }
+
+    enum RowIndex { kFirst, kSecond };
+
+    /// `useBytes` is called with the index of each row and its pixels as they were loaded.
+    template <class Format, class Form, class UseBytes>
+    static void RgbBlockTo420(RowPair<uint8_t> y, uint8_t* u, uint8_t* v, RowPair<const uint8_t> rgb,
+                              UseBytes useBytes) {
+        const auto convert = [&](RowIndex index, uint8_t* luma, const uint8_t* row) {
+            const Quads bytes = Format::Load(row);
+            useBytes(index, bytes);
+            const Quads pixels = Format::Pixels(bytes);
+            V::Store(luma, Luma<Form>(pixels));
+            return PixelChroma<Form>(pixels);
+        };
+        const Quads first = convert(kFirst, y.first, rgb.first);
+        const Quads second = convert(kSecond, y.second, rgb.second);
+        StoreAlternating(u, v, StoredChroma<2>(AddRows(first, second)));
     }
 
     template <class Format, class Form, To420 RowKernels::*kRest>
     [[gnu::flatten]] static void RgbTo420(RowPair<uint8_t> y, uint8_t* u, uint8_t* v,
                                           RowPair<const uint8_t> rgb, ptrdiff_t width) {
         const ptrdiff_t done = ForBlocks(width, kPixels, [&](ptrdiff_t x) {
-            RgbBlockTo420<Format, Form>(Advance(y, x), u + x / 2, v + x / 2,
-                                        Advance(rgb, Format::kBytes * x));
+            RgbBlockTo420<Format, Form>(Advance(y, x), u + x / 2, v + x / 2, Advance(rgb, Format::kBytes * x),
+                                        [](RowIndex, const Quads&) {});
         });
         if (done < width)
             (Rest(done).*kRest)(Advance(y, done), u + done / 2, v + done / 2,
@@ -230,9 +232,11 @@ class LaneKernels {
     [[gnu::flatten]] static void RgbaTo420(RowPair<uint8_t> y, uint8_t* u, uint8_t* v, RowPair<uint8_t> alpha,
                                            RowPair<const uint8_t> rgba, ptrdiff_t width) {
         const ptrdiff_t done = ForBlocks(width, kPixels, [&](ptrdiff_t x) {
-            RgbBlockTo420<Bgr32, FastRgbForm>(Advance(y, x), u + x / 2, v + x / 2, Advance(rgba, 4 * x));
-            V::Store(alpha.first + x, Bgr32::Alpha(rgba.first + 4 * x));
-            V::Store(alpha.second + x, Bgr32::Alpha(rgba.second + 4 * x));
+            const auto storeAlpha = [&](RowIndex row, const Quads& bytes) {
+                V::Store((row == kFirst ? alpha.first : alpha.second) + x, Bgr32::Alpha(bytes));
+            };
+            RgbBlockTo420<Bgr32, FastRgbForm>(Advance(y, x), u + x / 2, v + x / 2, Advance(rgba, 4 * x),
+                                              storeAlpha);
         });
         if (done < width)
             Rest(done).bgra32To420(Advance(y, done), u + done / 2, v + done / 2, Advance(alpha, done),
@@ -242,60 +246,57 @@ class LaneKernels {
     // --- YUV to RGB
     // --------------------------------------------------------------------------------------------------
 
-    /// The chroma terms of sixteen pixels a lane: those of the pixels 0 to 7, and of 8 to 15.
+    /// The chroma terms of sixteen pixels a lane: a word for every two pixels.
     struct ChromaTerms {
-        Vec red[2];
-        Vec green[2];
-        Vec blue[2];
-        Vec blueRest[2];
+        Vec red, green, blue, blueRest;
     };
 
-    /// From words of U and V, eight a lane.
+    /// From bytes of U and V, alternating. They are centred here, which their multiplication asks for; the
+    /// constants make up for it.
     template <class Form>
-    static ChromaTerms MakeTerms(Vec u, Vec v) {
+    static ChromaTerms MakeTerms(Vec uv) {
         using F = Form;
-        const auto times = [](Vec words, int factor) { return V::Mul16(words, V::Set16(factor)); };
-        const auto rest = [](Vec sum, int constant) {
-            return V::template Sra16<F::kShift>(V::Add16(sum, V::Set16(constant)));
+        const Vec centred = V::Xor(uv, V::Set8(-128));
+        const auto weighted = [=](int ofU, int ofV) {
+            return V::MulAddU8S8(V::Set16(ofU | ofV << 8), centred);
         };
-        const Vec red = V::Add16(V::Add16(times(v, F::kRedWhole), V::Set16(F::kRedConstant)),
-                                 rest(times(v, F::kRedRest), F::kRedRestConstant));
-        const Vec green = V::Add16(
-            V::Add16(V::Add16(times(u, F::kGreenUWhole), times(v, F::kGreenVWhole)),
-                     V::Set16(F::kGreenConstant)),
-            rest(V::Add16(times(u, F::kGreenURest), times(v, F::kGreenVRest)), F::kGreenRestConstant));
-        const Vec blue = V::Xor(V::template Sll16<8>(u), V::Set16(-0x8000));
-        const Vec blueRest = V::Add16(V::Add16(times(u, F::kBlueWhole), V::Set16(F::kBlueConstant)),
-                                      rest(times(u, F::kBlueRest), F::kBlueRestConstant));
-        return {{V::UnpackLo16(red, red), V::UnpackHi16(red, red)},
-                {V::UnpackLo16(green, green), V::UnpackHi16(green, green)},
-                {V::UnpackLo16(blue, blue), V::UnpackHi16(blue, blue)},
-                {V::UnpackLo16(blueRest, blueRest), V::UnpackHi16(blueRest, blueRest)}};
+        const auto rest = [=](int ofU, int ofV, int constant) {
+            return V::template Sra16<F::kShift>(
+                V::Add16(weighted(ofU, ofV), V::Set16(constant + 128 * (ofU + ofV))));
+        };
+        const auto plus = [](int constant, Vec words) { return V::Add16(words, V::Set16(constant)); };
+        const Vec red = plus(F::kRedConstant + 128 * F::kRedWhole,
+                             V::Add16(weighted(0, F::kRedWhole), rest(0, F::kRedRest, F::kRedRestConstant)));
+        // The whole factors of green are negative, the weights are not.
+        const Vec green = plus(F::kGreenConstant + 128 * (F::kGreenUWhole + F::kGreenVWhole),
+                               V::Sub16(rest(F::kGreenURest, F::kGreenVRest, F::kGreenRestConstant),
+                                        weighted(-F::kGreenUWhole, -F::kGreenVWhole)));
+        const Vec blueRest =
+            plus(F::kBlueConstant + 128 * F::kBlueWhole,
+                 V::Add16(weighted(F::kBlueWhole, 0), rest(F::kBlueRest, 0, F::kBlueRestConstant)));
+        return {red, green, V::template Sll16<8>(centred), blueRest};
     }
 
-    /// Bytes of sixteen pixels a lane.
+    /// Bytes of sixteen pixels a lane: the even pixels, then the odd ones, as the chroma terms ask for.
     struct Components {
         Vec blue, green, red;
     };
-
-    /// `luma`: the terms of the pixels 0 to 7, and of 8 to 15.
-    static Components AddTerms(const Vec (&luma)[2], const ChromaTerms& terms) {
-        const auto component = [](Vec low, Vec high) {
-            return V::PackUs16(V::template Sra16<7>(low), V::template Sra16<7>(high));
-        };
-        return {component(V::AddSat16(V::AddSat16(luma[0], terms.blue[0]), terms.blueRest[0]),
-                          V::AddSat16(V::AddSat16(luma[1], terms.blue[1]), terms.blueRest[1])),
-                component(V::AddSat16(luma[0], terms.green[0]), V::AddSat16(luma[1], terms.green[1])),
-                component(V::AddSat16(luma[0], terms.red[0]), V::AddSat16(luma[1], terms.red[1]))};
-    }
+    static constexpr size_t PlaceOfPixel(size_t pixel) { return pixel / 2 + pixel % 2 * 8; }
 
     template <class Form>
-    static Components FromPlanarLuma(Vec y, const ChromaTerms& terms) {
+    static Components MakeComponents(Vec y, const ChromaTerms& terms) {
         const Vec centred = V::Xor(y, V::Set8(-128));
-        const Vec weights = V::Set16(Form::kLumaWeight | Form::kLumaConstant << 8);
-        const Vec luma[2] = {V::MulAddU8S8(weights, V::UnpackLo8(centred, V::Set8(127))),
-                             V::MulAddU8S8(weights, V::UnpackHi8(centred, V::Set8(127)))};
-        return AddTerms(luma, terms);
+        const Vec offset = V::Set16(128 * Form::kLumaWeight - Form::kBias);
+        const Vec even = V::Add16(V::MulAddU8S8(V::Set16(Form::kLumaWeight), centred), offset);
+        const Vec odd = V::Add16(V::MulAddU8S8(V::Set16(Form::kLumaWeight << 8), centred), offset);
+        const auto component = [](Vec evenSum, Vec oddSum) {
+            return V::PackUs16(V::MulHigh16(evenSum, V::Set16(1 << 9)),
+                               V::MulHigh16(oddSum, V::Set16(1 << 9)));
+        };
+        return {component(V::AddSat16(V::AddSat16(even, terms.blue), terms.blueRest),
+                          V::AddSat16(V::AddSat16(odd, terms.blue), terms.blueRest)),
+                component(V::AddSat16(even, terms.green), V::AddSat16(odd, terms.green)),
+                component(V::AddSat16(even, terms.red), V::AddSat16(odd, terms.red))};
     }
 
     struct Bgr24Target {
@@ -307,7 +308,7 @@ class LaneKernels {
             LaneBytes indices{};
             for (size_t i = 0; i < 48; ++i)
                 if (i % 3 == component)
-                    indices[i % 16] = static_cast<int8_t>(i / 3);
+                    indices[i % 16] = static_cast<int8_t>(PlaceOfPixel(i / 3));
             return indices;
         }
         static constexpr LaneBytes EveryThird(size_t first) {
@@ -318,11 +319,14 @@ class LaneKernels {
         }
 
         static void Store(uint8_t* p, const Components& c) {
-            const Vec blue = V::Shuffle8(c.blue, V::Lane(Spread(0)));
-            const Vec green = V::Shuffle8(c.green, V::Lane(Spread(1)));
-            const Vec red = V::Shuffle8(c.red, V::Lane(Spread(2)));
-            const auto weave = [](Vec at0, Vec at1, Vec at2) {
-                return V::Blend8(V::Blend8(at0, at1, V::Lane(EveryThird(1))), at2, V::Lane(EveryThird(2)));
+            constexpr LaneBytes kSpread[3] = {Spread(0), Spread(1), Spread(2)};
+            constexpr LaneBytes kSecond = EveryThird(1);
+            constexpr LaneBytes kThird = EveryThird(2);
+            const Vec blue = V::Shuffle8(c.blue, V::Lane(kSpread[0]));
+            const Vec green = V::Shuffle8(c.green, V::Lane(kSpread[1]));
+            const Vec red = V::Shuffle8(c.red, V::Lane(kSpread[2]));
+            const auto weave = [=](Vec at0, Vec at1, Vec at2) {
+                return V::Blend8(V::Blend8(at0, at1, V::Lane(kSecond)), at2, V::Lane(kThird));
             };
             const Vec parts[3] = {weave(blue, green, red), weave(green, red, blue), weave(red, blue, green)};
             V::StoreLanes(p, parts);
@@ -333,10 +337,18 @@ class LaneKernels {
     struct Bgr32Target {
         static constexpr ptrdiff_t kBytes = 4;
 
+        static Vec InPixelOrder(Vec component) {
+            constexpr LaneBytes kPlaces{0, 8, 1, 9, 2, 10, 3, 11, 4, 12, 5, 13, 6, 14, 7, 15};
+            return V::Shuffle8(component, V::Lane(kPlaces));
+        }
+
         static void Store(uint8_t* p, const Components& c) {
+            const Vec blue = InPixelOrder(c.blue);
+            const Vec green = InPixelOrder(c.green);
+            const Vec red = InPixelOrder(c.red);
             const Vec fourth = V::Set8(-1);
-            const Vec blueGreen[2] = {V::UnpackLo8(c.blue, c.green), V::UnpackHi8(c.blue, c.green)};
-            const Vec redFourth[2] = {V::UnpackLo8(c.red, fourth), V::UnpackHi8(c.red, fourth)};
+            const Vec blueGreen[2] = {V::UnpackLo8(blue, green), V::UnpackHi8(blue, green)};
+            const Vec redFourth[2] = {V::UnpackLo8(red, fourth), V::UnpackHi8(red, fourth)};
             Vec quads[4] = {
                 V::UnpackLo16(blueGreen[0], redFourth[0]), V::UnpackHi16(blueGreen[0], redFourth[0]),
                 V::UnpackLo16(blueGreen[1], redFourth[1]), V::UnpackHi16(blueGreen[1], redFourth[1])};
@@ -344,8 +356,8 @@ class LaneKernels {
                 V::StoreLanes(p, quads);
             } else {
                 const Vec kept = V::Set32(static_cast<int32_t>(0xFF000000));
-                for (int quad = 0; quad < 4; ++quad)
-                    quads[quad] = V::Blend8(quads[quad], V::LoadLanes(p + 16 * quad, 64), kept);
+                for (int i = 0; i < 4; ++i)
+                    quads[i] = V::Blend8(quads[i], V::LoadLanes(p + 16 * i, 64), kept);
                 V::Cached::StoreLanes(p, quads); // what has been read is in the cache
             }
         }
@@ -355,10 +367,12 @@ class LaneKernels {
     [[gnu::flatten]] static void RgbFrom420(RowPair<uint8_t> rgb, RowPair<const uint8_t> y, const uint8_t* u,
                                             const uint8_t* v, ptrdiff_t width) {
         const ptrdiff_t done = ForBlocks(width, kPixels, [&](ptrdiff_t x) {
-            const ChromaTerms terms = MakeTerms<Form>(V::LoadWords(u + x / 2), V::LoadWords(v + x / 2));
-            Target::Store(rgb.first + Target::kBytes * x, FromPlanarLuma<Form>(V::Load(y.first + x), terms));
-            Target::Store(rgb.second + Target::kBytes * x,
-                          FromPlanarLuma<Form>(V::Load(y.second + x), terms));
+            const auto convert = [&](uint8_t* target, const uint8_t* luma, const ChromaTerms& terms) {
+                Target::Store(target, MakeComponents<Form>(V::Load(luma), terms));
+            };
+            const ChromaTerms terms = MakeTerms<Form>(V::LoadAlternating(u + x / 2, v + x / 2));
+            convert(rgb.first + Target::kBytes * x, y.first + x, terms);
+            convert(rgb.second + Target::kBytes * x, y.second + x, terms);
         });
         if (done < width)
             (Rest(done).*kRest)(Advance(rgb, Target::kBytes * done), Advance(y, done), u + done / 2,
@@ -380,34 +394,46 @@ class LaneKernels {
         return kOrder == kYuy2 ? HighBytes(packed) : LowBytes(packed);
     }
 
+    /// Words of which the upper byte is chroma, the lower one zero.
+    template <PackedOrder kOrder>
+    static Vec ChromaAbove(Vec packed) {
+        return kOrder == kYuy2 ? V::And(packed, V::Set16(-0x100)) : V::template Sll16<8>(packed);
+    }
+
+    /// Stores the bytes of two vectors alternating.
+    static void StoreInterleaved(uint8_t* p, Vec even, Vec odd) {
+        const Vec halves[2] = {V::UnpackLo8(even, odd), V::UnpackHi8(even, odd)};
+        V::StoreLanes(p, halves);
+    }
+
     /// Stores sixteen pixels a lane from their Y and the bytes U, V, U, V, ...
     template <PackedOrder kOrder>
     static void StorePacked(uint8_t* p, Vec y, Vec uv) {
-        const Vec even = kOrder == kYuy2 ? y : uv;
-        const Vec odd = kOrder == kYuy2 ? uv : y;
-        const Vec halves[2] = {V::UnpackLo8(even, odd), V::UnpackHi8(even, odd)};
-        V::StoreLanes(p, halves);
+        StoreInterleaved(p, kOrder == kYuy2 ? y : uv, kOrder == kYuy2 ? uv : y);
     }
 
     template <PackedOrder kOrder>
     [[gnu::flatten]] static void PackedTo420(RowPair<uint8_t> y, uint8_t* u, uint8_t* v,
                                              RowPair<const uint8_t> packed, ptrdiff_t width) {
         const ptrdiff_t done = ForBlocks(width, kPixels, [&](ptrdiff_t x) {
-            Vec lumaFirst[2];
-            Vec lumaSecond[2];
-            Vec chroma[2];
-            for (int half = 0; half < 2; ++half) {
-                const Vec first = V::LoadLanes(packed.first + 2 * x + 16 * half, 32);
-                const Vec second = V::LoadLanes(packed.second + 2 * x + 16 * half, 32);
-                lumaFirst[half] = LumaWords<kOrder>(first);
-                lumaSecond[half] = LumaWords<kOrder>(second);
-                chroma[half] =
-                    V::template Srl16<1>(V::Add16(ChromaWords<kOrder>(first), ChromaWords<kOrder>(second)));
-            }
-            V::Store(y.first + x, V::PackUs16(lumaFirst[0], lumaFirst[1]));
-            V::Store(y.second + x, V::PackUs16(lumaSecond[0], lumaSecond[1]));
-            const Vec uv = V::PackUs16(chroma[0], chroma[1]);
-            V::StoreHalves(u + x / 2, v + x / 2, V::PackUs16(LowBytes(uv), HighBytes(uv)));
+            constexpr LaneBytes kApart{0, 4, 8, 12, 1, 5, 9, 13, 2, 6, 10, 14, 3, 7, 11, 15};
+            const auto load = [=](const uint8_t* row, int half) {
+                return V::LoadLanes(row + 2 * x + 16 * half, 32);
+            };
+            const Vec first[2] = {load(packed.first, 0), load(packed.first, 1)};
+            const Vec second[2] = {load(packed.second, 0), load(packed.second, 1)};
+            const auto luma = [](const Vec(&halves)[2]) {
+                return V::PackUs16(LumaWords<kOrder>(halves[0]), LumaWords<kOrder>(halves[1]));
+            };
+            // In the upper bytes: without anything below them the average's rounding has no effect there.
+            const auto average = [](Vec a, Vec b) {
+                return V::Average16(ChromaAbove<kOrder>(a), ChromaAbove<kOrder>(b));
+            };
+            const Vec chroma = V::Blend8(HighBytes(average(first[0], second[0])),
+                                         average(first[1], second[1]), V::Set16(-0x100));
+            V::Store(y.first + x, luma(first));
+            V::Store(y.second + x, luma(second));
+            V::StoreHalves(u + x / 2, v + x / 2, V::ExchangeMiddle(V::Shuffle8(chroma, V::Lane(kApart))));
         });
         if (done < width)
             Rest(done).packedTo420[kOrder](Advance(y, done), u + done / 2, v + done / 2,
@@ -418,7 +444,7 @@ class LaneKernels {
     [[gnu::flatten]] static void PackedFrom420(RowPair<uint8_t> packed, RowPair<const uint8_t> y,
                                                const uint8_t* u, const uint8_t* v, ptrdiff_t width) {
         const ptrdiff_t done = ForBlocks(width, kPixels, [&](ptrdiff_t x) {
-            const Vec uv = V::Or(V::LoadWords(u + x / 2), V::template Sll16<8>(V::LoadWords(v + x / 2)));
+            const Vec uv = V::LoadAlternating(u + x / 2, v + x / 2);
             StorePacked<kOrder>(packed.first + 2 * x, V::Load(y.first + x), uv);
             StorePacked<kOrder>(packed.second + 2 * x, V::Load(y.second + x), uv);
         });
@@ -429,11 +455,10 @@ class LaneKernels {
 
     template <PackedOrder kOrder>
     [[gnu::flatten]] static void PackedFromBgr24(uint8_t* packed, const uint8_t* rgb, ptrdiff_t width) {
-        constexpr LaneBytes kUvOrder{0, 8, 4, 12, 1, 9, 5, 13, 2, 10, 6, 14, 3, 11, 7, 15};
         const ptrdiff_t done = ForBlocks(width, kPixels, [&](ptrdiff_t x) {
-            const Pixels pixels = Bgr24::Load(rgb + 3 * x);
-            const Vec uv = V::Shuffle8(StoredChroma<1>(PixelChroma<FastRgbForm>(pixels)), V::Lane(kUvOrder));
-            StorePacked<kOrder>(packed + 2 * x, Luma<FastRgbForm>(pixels), uv);
+            const Quads pixels = Bgr24::Pixels(Bgr24::Load(rgb + 3 * x));
+            StorePacked<kOrder>(packed + 2 * x, Luma<FastRgbForm>(pixels),
+                                StoredChroma<1>(PixelChroma<FastRgbForm>(pixels)));
         });
         if (done < width)
             Rest(done).packedFromBgr24[kOrder](packed + 2 * done, rgb + 3 * done, width - done);
@@ -441,16 +466,11 @@ class LaneKernels {
 
     template <PackedOrder kOrder>
     [[gnu::flatten]] static void Bgr24FromPacked(uint8_t* rgb, const uint8_t* packed, ptrdiff_t width) {
-        using Form = FastYuvForm;
         const ptrdiff_t done = ForBlocks(width, kPixels, [&](ptrdiff_t x) {
             const Vec halves[2] = {V::LoadLanes(packed + 2 * x, 32), V::LoadLanes(packed + 2 * x + 16, 32)};
+            const Vec y = V::PackUs16(LumaWords<kOrder>(halves[0]), LumaWords<kOrder>(halves[1]));
             const Vec uv = V::PackUs16(ChromaWords<kOrder>(halves[0]), ChromaWords<kOrder>(halves[1]));
-            const ChromaTerms terms = MakeTerms<Form>(LowBytes(uv), HighBytes(uv));
-            Vec luma[2];
-            for (int half = 0; half < 2; ++half)
-                luma[half] = V::Sub16(V::Mul16(LumaWords<kOrder>(halves[half]), V::Set16(Form::kLumaWeight)),
-                                      V::Set16(Form::kBias));
-            Bgr24Target::Store(rgb + 3 * x, AddTerms(luma, terms));
+            Bgr24Target::Store(rgb + 3 * x, MakeComponents<FastYuvForm>(y, MakeTerms<FastYuvForm>(uv)));
         });
         if (done < width)
             Rest(done).bgr24FromPacked[kOrder](rgb + 3 * done, packed + 2 * done, width - done);
@@ -472,13 +492,15 @@ class LaneKernels {
     [[gnu::flatten]] static void Halve(uint8_t* target, RowPair<const uint8_t> source, ptrdiff_t width) {
         const auto average = [](const uint8_t* first, const uint8_t* second) {
             const Vec ones = V::Set8(1);
-            return V::template Srl16<2>(V::Add16(V::MulAddU8S8(V::LoadLanes(first, 32), ones),
-                                                 V::MulAddU8S8(V::LoadLanes(second, 32), ones)));
+            return V::template Srl16<2>(
+                V::Add16(V::MulAddU8S8(V::Load(first), ones), V::MulAddU8S8(V::Load(second), ones)));
         };
         const ptrdiff_t done = ForBlocks(width, 2 * kPixels, [&](ptrdiff_t x) {
             const uint8_t* const first = source.first + x;
             const uint8_t* const second = source.second + x;
-            V::Store(target + x / 2, V::PackUs16(average(first, second), average(first + 16, second + 16)));
+            V::Store(target + x / 2,
+                     V::ExchangeMiddle(
+                         V::PackUs16(average(first, second), average(first + kPixels, second + kPixels))));
         });
         if (done < width)
             Rest(done).halve(target + done / 2, Advance(source, done), width - done);
@@ -487,9 +509,8 @@ class LaneKernels {
     [[gnu::flatten]] static void Doubled(RowPair<uint8_t> target, const uint8_t* source, ptrdiff_t width) {
         const ptrdiff_t done = ForBlocks(width, kPixels, [&](ptrdiff_t x) {
             const Vec samples = V::Load(source + x);
-            const Vec halves[2] = {V::UnpackLo8(samples, samples), V::UnpackHi8(samples, samples)};
-            V::StoreLanes(target.first + 2 * x, halves);
-            V::StoreLanes(target.second + 2 * x, halves);
+            StoreInterleaved(target.first + 2 * x, samples, samples);
+            StoreInterleaved(target.second + 2 * x, samples, samples);
         });
         if (done < width)
             Rest(done).doubled(Advance(target, 2 * done), source + done, width - done);

@@ -23,16 +23,18 @@ struct Avx2 {
     }
 
     static Vec And(Vec a, Vec b) { return _mm256_and_si256(a, b); }
-    static Vec Or(Vec a, Vec b) { return _mm256_or_si256(a, b); }
     static Vec Xor(Vec a, Vec b) { return _mm256_xor_si256(a, b); }
     static Vec Add8(Vec a, Vec b) { return _mm256_add_epi8(a, b); }
     static Vec Add16(Vec a, Vec b) { return _mm256_add_epi16(a, b); }
     static Vec AddSat16(Vec a, Vec b) { return _mm256_adds_epi16(a, b); }
     static Vec Sub16(Vec a, Vec b) { return _mm256_sub_epi16(a, b); }
     static Vec Add32(Vec a, Vec b) { return _mm256_add_epi32(a, b); }
-    static Vec Mul16(Vec a, Vec b) { return _mm256_mullo_epi16(a, b); }
+    static Vec MulHigh16(Vec a, Vec b) { return _mm256_mulhi_epi16(a, b); }
     static Vec MulAdd16(Vec a, Vec b) { return _mm256_madd_epi16(a, b); }
     static Vec MulAddU8S8(Vec a, Vec b) { return _mm256_maddubs_epi16(a, b); }
+    static Vec Average16(Vec a, Vec b) { return _mm256_avg_epu16(a, b); }
+    static Vec PackS32(Vec a, Vec b) { return _mm256_packs_epi32(a, b); }
+    static Vec PackS16(Vec a, Vec b) { return _mm256_packs_epi16(a, b); }
     static Vec PackUs16(Vec a, Vec b) { return _mm256_packus_epi16(a, b); }
     static Vec Shuffle8(Vec a, Vec indices) { return _mm256_shuffle_epi8(a, indices); }
     static Vec UnpackLo8(Vec a, Vec b) { return _mm256_unpacklo_epi8(a, b); }
@@ -40,6 +42,13 @@ struct Avx2 {
     static Vec UnpackLo16(Vec a, Vec b) { return _mm256_unpacklo_epi16(a, b); }
     static Vec UnpackHi16(Vec a, Vec b) { return _mm256_unpackhi_epi16(a, b); }
     static Vec Blend8(Vec a, Vec b, Vec mask) { return _mm256_blendv_epi8(a, b, mask); }
+
+    static Vec EvenDwords(Vec a, Vec b) { return ShuffleDwords<_MM_SHUFFLE(2, 0, 2, 0)>(a, b); }
+    static Vec OddDwords(Vec a, Vec b) { return ShuffleDwords<_MM_SHUFFLE(3, 1, 3, 1)>(a, b); }
+    template <int kOrder>
+    static Vec ShuffleDwords(Vec a, Vec b) {
+        return _mm256_castps_si256(_mm256_shuffle_ps(_mm256_castsi256_ps(a), _mm256_castsi256_ps(b), kOrder));
+    }
 
     template <int kMask>
     static Vec Blend16(Vec a, Vec b) {
@@ -61,14 +70,6 @@ struct Avx2 {
     static Vec Srl32(Vec a) {
         return _mm256_srli_epi32(a, kBits);
     }
-    template <int kBits>
-    static Vec Sll64(Vec a) {
-        return _mm256_slli_epi64(a, kBits);
-    }
-    template <int kBits>
-    static Vec Srl64(Vec a) {
-        return _mm256_srli_epi64(a, kBits);
-    }
 
     static __m128i LoadLane(const uint8_t* p) { return _mm_loadu_si128(reinterpret_cast<const __m128i*>(p)); }
     static __m128i LowLane(Vec a) { return _mm256_castsi256_si128(a); }
@@ -78,17 +79,24 @@ struct Avx2 {
     }
 
     static Vec Load(const uint8_t* p) { return _mm256_loadu_si256(reinterpret_cast<const Vec*>(p)); }
+    /// The 16 bytes at p and those `distance` further on, which is at least 16, by two loads that overlap
+    /// what lies between: a blend takes any of four pipes, an insertion one only.
     static Vec LoadLanes(const uint8_t* p, ptrdiff_t distance) {
-        return Join(LoadLane(p), LoadLane(p + distance));
+        return _mm256_blend_epi32(Load(p), Load(p + distance - 16), 0xF0);
     }
-    static Vec LoadWords(const uint8_t* p) { return _mm256_cvtepu8_epi16(LoadLane(p)); }
+    static Vec LoadAlternating(const uint8_t* even, const uint8_t* odd) {
+        return _mm256_or_si256(_mm256_cvtepu8_epi16(LoadLane(even)),
+                               Sll16<8>(_mm256_cvtepu8_epi16(LoadLane(odd))));
+    }
+
+    /// The second and third 8 bytes exchanged.
+    static Vec ExchangeMiddle(Vec a) { return _mm256_permute4x64_epi64(a, _MM_SHUFFLE(3, 1, 2, 0)); }
 
     static void Store(uint8_t* p, Vec a) { _mm256_storeu_si256(reinterpret_cast<Vec*>(p), a); }
     static void StoreLane(uint8_t* p, __m128i a) { _mm_storeu_si128(reinterpret_cast<__m128i*>(p), a); }
     static void StoreHalves(uint8_t* low, uint8_t* high, Vec a) {
-        const Vec halves = _mm256_permute4x64_epi64(a, _MM_SHUFFLE(3, 1, 2, 0));
-        StoreLane(low, LowLane(halves));
-        StoreLane(high, HighLane(halves));
+        StoreLane(low, LowLane(a));
+        StoreLane(high, HighLane(a));
     }
 
     static Vec LowLanes(Vec a, Vec b) { return _mm256_permute2x128_si256(a, b, 0x20); }
@@ -109,7 +117,6 @@ struct Avx2 {
         Store(p + 64, HighLanes(parts[0], parts[1]));
         Store(p + 96, HighLanes(parts[2], parts[3]));
     }
-
     static void FinishRow() {}
 };
 
@@ -122,9 +129,8 @@ struct Avx2Large : Avx2 {
         StoreLane(p + 16, HighLane(a));
     }
     static void StoreHalves(uint8_t* low, uint8_t* high, Vec a) {
-        const Vec halves = _mm256_permute4x64_epi64(a, _MM_SHUFFLE(3, 1, 2, 0));
-        StoreLane(low, LowLane(halves));
-        StoreLane(high, HighLane(halves));
+        StoreLane(low, LowLane(a));
+        StoreLane(high, HighLane(a));
     }
     template <size_t kParts>
     static void StoreLanes(uint8_t* p, const Vec (&parts)[kParts]) {

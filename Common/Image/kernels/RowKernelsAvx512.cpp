@@ -126,14 +126,8 @@ struct Packed {
 };
 
 // RGB to YUV ------------------------------------------------------------------------------------------------
-// A lane of 32 bits holds a pixel as the words (blue, red) and (green, green). A sum starts with its offset
-// of 16 or 128, so that the component comes out as byte 2 of its lane.
-
-/// 16 pixels, a lane each.
-struct Pixels {
-    __m512i blueRed;
-    __m512i green;
-};
+// A lane of 32 bits holds a pixel as the bytes B, R, G, R. A sum starts with its offset of 16 or 128, so that
+// the component comes out as byte 2 of its lane.
 
 /// 16 pixels' components, each in byte 2 of its lane.
 struct Components {
@@ -143,36 +137,43 @@ struct Components {
 template <class Form>
 class RgbToYuv {
 public:
-    Components operator()(Pixels p) const {
-        const __m512i differences = _mm512_sub_epi16(p.blueRed, p.green);
-        const __m512i y = _mm512_dpwssd_epi32(yStart_, p.blueRed, yBlueRed_);
-        return {_mm512_dpwssd_epi32(y, p.green, yGreen_), _mm512_dpwssd_epi32(chromaStart_, differences, cb_),
-                _mm512_dpwssd_epi32(CrStart(p.green), differences, cr_)};
+    Components operator()(__m512i pixels) const {
+        const __m512i luma = _mm512_maddubs_epi16(pixels, yInner_);
+        const __m512i differences = _mm512_maddubs_epi16(pixels, BytePairs(1, -1));
+        return {_mm512_dpwssd_epi32(yStart_, luma, yOuter_),
+                _mm512_dpwssd_epi32(chromaStart_, differences, cb_),
+                _mm512_dpwssd_epi32(CrStart(pixels), differences, cr_)};
     }
 
 private:
-    __m512i CrStart(__m512i green) const {
+    __m512i CrStart(__m512i pixels) const {
         if constexpr (Form::kCrSum == 0) {
             return chromaStart_;
         } else {
-            static_assert(Form::kCrSum == 4);
-            constexpr int kMaskedOrThird = 0xEA; // (a & b) | c
-            return _mm512_ternarylogic_epi32(_mm512_slli_epi16(green, 2), _mm512_set1_epi32(0xFFFF),
-                                             chromaStart_, kMaskedOrThird);
+            // 4 R, and of G what is less than the step of a sum
+            static_assert(Form::kCrSum == 4 && Form::kScale == 4);
+            return _mm512_add_epi32(chromaStart_, _mm512_srli_epi32(pixels, 22));
         }
     }
 
     __m512i yStart_ = _mm512_set1_epi32((16 << 16) + Form::kRounding);
-    __m512i yBlueRed_ = Words(Form::kYBlueWeight, Form::kYRedWeight);
-    __m512i yGreen_ = Words(Form::kYGreenWeight, Form::kYGreenWeight);
+    __m512i yInner_ = Words((Form::kYInnerBlue & 0xFF) | Form::kYBesideBlue * 256,
+                            (Form::kYInnerGreen & 0xFF) | Form::kYBesideGreen * 256);
+    __m512i yOuter_ = Words(Form::kYOuterBlue, Form::kYOuterGreen);
     __m512i chromaStart_ = _mm512_set1_epi32((128 << 16) + Form::kRounding);
-    __m512i cb_ = Words(Form::kCbBlueWeight, Form::kCbRedWeight);
-    __m512i cr_ = Words(Form::kCrBlueWeight, Form::kCrRedWeight);
+    __m512i cb_ = Words(Form::kCbBlueWeight, Form::kCbGreenWeight);
+    __m512i cr_ = Words(Form::kCrBlueWeight, Form::kCrGreenWeight);
 };
+
+/// The order B, R, G, R: which byte of a pixel stands at byte i of its lane.
+constexpr int ComponentAt(int i) {
+    constexpr int kOrder[4] = {0, 2, 1, 2};
+    return kOrder[i % 4];
+}
 
 /// 32 pixels of a row.
 struct PixelRun {
-    Pixels first, second;
+    __m512i first, second;
 };
 
 /// Reads pixels of four bytes.
@@ -183,18 +184,13 @@ public:
         const uint8_t* const source = row + 4 * x;
         Prefetch(source);
         Prefetch(source + 64);
-        return {Split(Load(columns, source, 4 * columns.count)),
-                Split(Load(columns, source + 64, 4 * columns.count - 64))};
+        return {_mm512_shuffle_epi8(Load(columns, source, 4 * columns.count), places_),
+                _mm512_shuffle_epi8(Load(columns, source + 64, 4 * columns.count - 64), places_)};
     }
 
 private:
-    Pixels Split(__m512i pixels) const {
-        return {_mm512_and_si512(pixels, blueRed_), _mm512_shuffle_epi8(pixels, green_)};
-    }
-
-    static constexpr Table kGreen = MakeTable([](int i) { return i % 2 == 0 ? i / 4 * 4 % 16 + 1 : 0x80; });
-    __m512i blueRed_ = _mm512_set1_epi32(0x00FF00FF);
-    __m512i green_ = kGreen.Load();
+    static constexpr Table kPlaces = MakeTable([](int i) { return i % 16 / 4 * 4 + ComponentAt(i); });
+    __m512i places_ = kPlaces.Load();
 };
 
 /// Reads pixels of three bytes. The second load begins 16 bytes early, so that it ends with the run.
@@ -207,25 +203,17 @@ public:
         Prefetch(source + 64);
         const __m512i first = Load(columns, source, 3 * columns.count);
         const __m512i second = Load(columns, source + kSecond, 3 * columns.count - kSecond);
-        return {{Spread(blueRed_, first), Spread(green_, first)},
-                {Spread(blueRedLater_, second), Spread(greenLater_, second)}};
+        return {_mm512_permutexvar_epi8(places_, first), _mm512_permutexvar_epi8(placesLater_, second)};
     }
 
 private:
-    static __m512i Spread(__m512i places, __m512i bytes) {
-        return _mm512_maskz_permutexvar_epi8(~kOddBytes, places, bytes);
-    }
-
     static constexpr int kSecond = 32;
     static constexpr int kLater = 3 * 16 - kSecond;
-    static constexpr Table kBlueRed = MakeTable([](int i) { return i / 4 * 3 + i % 4; });
-    static constexpr Table kGreen = MakeTable([](int i) { return i / 4 * 3 + 1; });
-    static constexpr Table kBlueRedLater = MakeTable([](int i) { return i / 4 * 3 + i % 4 + kLater; });
-    static constexpr Table kGreenLater = MakeTable([](int i) { return i / 4 * 3 + 1 + kLater; });
-    __m512i blueRed_ = kBlueRed.Load();
-    __m512i green_ = kGreen.Load();
-    __m512i blueRedLater_ = kBlueRedLater.Load();
-    __m512i greenLater_ = kGreenLater.Load();
+    static constexpr Table kPlaces = MakeTable([](int i) { return i / 4 * 3 + ComponentAt(i); });
+    static constexpr Table kPlacesLater =
+        MakeTable([](int i) { return i / 4 * 3 + ComponentAt(i) + kLater; });
+    __m512i places_ = kPlaces.Load();
+    __m512i placesLater_ = kPlacesLater.Load();
 };
 
 /// Byte `byte` of the 32 lanes of two registers, in the low half.

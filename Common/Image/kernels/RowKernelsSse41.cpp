@@ -14,9 +14,14 @@ struct Sse41 {
 
     static Vec Load(const uint8_t* p) { return _mm_loadu_si128(reinterpret_cast<const Vec*>(p)); }
     static Vec LoadLanes(const uint8_t* p, ptrdiff_t) { return Load(p); }
-    static Vec LoadWords(const uint8_t* p) {
-        return _mm_cvtepu8_epi16(_mm_loadl_epi64(reinterpret_cast<const Vec*>(p)));
+    static Vec LoadHalf(const uint8_t* p) { return _mm_loadl_epi64(reinterpret_cast<const Vec*>(p)); }
+    static Vec LoadAlternating(const uint8_t* even, const uint8_t* odd) {
+        return UnpackLo8(LoadHalf(even), LoadHalf(odd));
     }
+
+    /// Of longer vectors, the second and third 8 bytes exchanged.
+    static Vec ExchangeMiddle(Vec a) { return a; }
+
     static void Store(uint8_t* p, Vec a) { _mm_storeu_si128(reinterpret_cast<Vec*>(p), a); }
     template <size_t kParts>
     static void StoreLanes(uint8_t* p, const Vec (&parts)[kParts]) {
@@ -41,16 +46,18 @@ struct Sse41 {
     }
 
     static Vec And(Vec a, Vec b) { return _mm_and_si128(a, b); }
-    static Vec Or(Vec a, Vec b) { return _mm_or_si128(a, b); }
     static Vec Xor(Vec a, Vec b) { return _mm_xor_si128(a, b); }
     static Vec Add8(Vec a, Vec b) { return _mm_add_epi8(a, b); }
     static Vec Add16(Vec a, Vec b) { return _mm_add_epi16(a, b); }
     static Vec AddSat16(Vec a, Vec b) { return _mm_adds_epi16(a, b); }
     static Vec Sub16(Vec a, Vec b) { return _mm_sub_epi16(a, b); }
     static Vec Add32(Vec a, Vec b) { return _mm_add_epi32(a, b); }
-    static Vec Mul16(Vec a, Vec b) { return _mm_mullo_epi16(a, b); }
+    static Vec MulHigh16(Vec a, Vec b) { return _mm_mulhi_epi16(a, b); }
     static Vec MulAdd16(Vec a, Vec b) { return _mm_madd_epi16(a, b); }
     static Vec MulAddU8S8(Vec a, Vec b) { return _mm_maddubs_epi16(a, b); }
+    static Vec Average16(Vec a, Vec b) { return _mm_avg_epu16(a, b); }
+    static Vec PackS32(Vec a, Vec b) { return _mm_packs_epi32(a, b); }
+    static Vec PackS16(Vec a, Vec b) { return _mm_packs_epi16(a, b); }
     static Vec PackUs16(Vec a, Vec b) { return _mm_packus_epi16(a, b); }
     static Vec Shuffle8(Vec a, Vec indices) { return _mm_shuffle_epi8(a, indices); }
     static Vec UnpackLo8(Vec a, Vec b) { return _mm_unpacklo_epi8(a, b); }
@@ -58,6 +65,13 @@ struct Sse41 {
     static Vec UnpackLo16(Vec a, Vec b) { return _mm_unpacklo_epi16(a, b); }
     static Vec UnpackHi16(Vec a, Vec b) { return _mm_unpackhi_epi16(a, b); }
     static Vec Blend8(Vec a, Vec b, Vec mask) { return _mm_blendv_epi8(a, b, mask); }
+
+    static Vec EvenDwords(Vec a, Vec b) { return ShuffleDwords<_MM_SHUFFLE(2, 0, 2, 0)>(a, b); }
+    static Vec OddDwords(Vec a, Vec b) { return ShuffleDwords<_MM_SHUFFLE(3, 1, 3, 1)>(a, b); }
+    template <int kOrder>
+    static Vec ShuffleDwords(Vec a, Vec b) {
+        return _mm_castps_si128(_mm_shuffle_ps(_mm_castsi128_ps(a), _mm_castsi128_ps(b), kOrder));
+    }
 
     template <int kMask>
     static Vec Blend16(Vec a, Vec b) {
@@ -78,14 +92,6 @@ struct Sse41 {
     template <int kBits>
     static Vec Srl32(Vec a) {
         return _mm_srli_epi32(a, kBits);
-    }
-    template <int kBits>
-    static Vec Sll64(Vec a) {
-        return _mm_slli_epi64(a, kBits);
-    }
-    template <int kBits>
-    static Vec Srl64(Vec a) {
-        return _mm_srli_epi64(a, kBits);
     }
 };
 
