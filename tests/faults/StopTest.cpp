@@ -11,6 +11,7 @@
 #include <condition_variable>
 #include <cstdio>
 #include <mutex>
+#include <ostream>
 #include <thread>
 #include <vector>
 
@@ -80,6 +81,10 @@ struct State {
     int64_t pictures = 1'000'000;
     unsigned outcome = kOutcomeStopped;
 };
+
+void PrintTo(const State& state, std::ostream* out) {
+    *out << state.name;
+}
 
 template <Gate& gate>
 State HeldBy(const char* name) {
