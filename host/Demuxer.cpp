@@ -12,6 +12,7 @@ constexpr std::size_t kEnoughPackets = 32;
 constexpr std::size_t kEnoughBytes = 16 << 20;
 constexpr int kToleratedFailures = 100;             // reads in a row that may fail on damaged data
 constexpr int64_t kLargestStep = 10 * kMediaSecond; // between packets of one stream; more is a new clock
+constexpr int64_t kLargestFall = kMediaSecond / 2;  // likewise, backwards
 constexpr double kPreroll = 0.2;                    // codecs need a little before the first good sample
 constexpr int kProbedPackets = 2000;                // read to find the picture where decoding can begin
 
@@ -205,18 +206,27 @@ void Demuxer::RepairClock(AVPacket& packet) {
     const AVRational mediaBase{1, kMediaSecond};
     const int64_t stamp = av_rescale_q(packet.dts, stream->time_base, mediaBase);
     const auto due = due_.find(packet.stream_index);
-    if (due != due_.end() && std::abs(stamp + clockShift_ - due->second) > kLargestStep) {
-        clockShift_ = due->second - stamp;
-        const std::lock_guard lock(mutex_);
-        ++clockJumps_;
+    int64_t shift = clockShift_;
+    if (due != due_.end()) {
+        const auto ahead = [&](int64_t candidate) { return stamp + candidate - due->second; };
+        // Where the clock changes, the last packets of one stream can come after the first ones of the other.
+        if (std::abs(ahead(earlierShift_)) < std::abs(ahead(shift))) {
+            shift = earlierShift_;
+        }
+        if (ahead(shift) > kLargestStep || ahead(shift) < -kLargestFall) {
+            earlierShift_ = clockShift_;
+            shift = clockShift_ = due->second - stamp;
+            const std::lock_guard lock(mutex_);
+            ++clockJumps_;
+        }
     }
     const int64_t step =
         packet.duration > 0 ? av_rescale_q(packet.duration, stream->time_base, mediaBase) : 0;
-    due_[packet.stream_index] = stamp + clockShift_ + step;
-    const int64_t shift = av_rescale_q(clockShift_, mediaBase, stream->time_base);
-    packet.dts += shift;
+    due_[packet.stream_index] = stamp + shift + step;
+    const int64_t ticks = av_rescale_q(shift, mediaBase, stream->time_base);
+    packet.dts += ticks;
     if (packet.pts != AV_NOPTS_VALUE) {
-        packet.pts += shift;
+        packet.pts += ticks;
     }
 }
 

@@ -88,6 +88,7 @@ private:
     int clockJumps_ = 0;
 
     int64_t clockShift_ = 0;     // media time added to stamps since the last jump of the source's clock
+    int64_t earlierShift_ = 0;   // the same before that jump
     std::map<int, int64_t> due_; // where the next packet of a stream is expected, in media time
     int failedReads_ = 0;
     std::thread thread_;
