@@ -194,17 +194,6 @@ unsigned ScriptedHost::OnCallback(unsigned kind, unsigned value, const ProgressI
     return kind == 0 && ++progressCalls == cancelAt ? 0 : 1;
 }
 
-std::string Trimmed(const std::string& text) {
-    std::string lines;
-    std::istringstream stream(text);
-    for (std::string line; std::getline(stream, line);) {
-        const size_t start = line.find_first_not_of(' ');
-        if (start != std::string::npos)
-            lines += line.substr(start) + "\n";
-    }
-    return lines;
-}
-
 namespace {
 
 std::string Filter(bool logLines) {

@@ -126,9 +126,6 @@ private:
     unsigned progressCalls = 0;
 };
 
-/// A text without the spaces that indent its lines and without empty lines.
-std::string Trimmed(const std::string& text);
-
 /// The log lines of the trace, or everything else, a line each.
 std::string LogLines();
 std::string TraceWithoutLog();
