@@ -489,29 +489,41 @@ class LaneKernels {
     // --- Planes
     // ------------------------------------------------------------------------------------------------------
 
+    // Blocks of half the size serve rows that are too short for a whole one.
+
     [[gnu::flatten]] static void Halve(uint8_t* target, RowPair<const uint8_t> source, ptrdiff_t width) {
-        const auto average = [](const uint8_t* first, const uint8_t* second) {
+        const auto average = [&](ptrdiff_t x) {
             const Vec ones = V::Set8(1);
-            return V::template Srl16<2>(
-                V::Add16(V::MulAddU8S8(V::Load(first), ones), V::MulAddU8S8(V::Load(second), ones)));
+            return V::template Srl16<2>(V::Add16(V::MulAddU8S8(V::Load(source.first + x), ones),
+                                                 V::MulAddU8S8(V::Load(source.second + x), ones)));
         };
-        const ptrdiff_t done = ForBlocks(width, 2 * kPixels, [&](ptrdiff_t x) {
-            const uint8_t* const first = source.first + x;
-            const uint8_t* const second = source.second + x;
-            V::Store(target + x / 2,
-                     V::ExchangeMiddle(
-                         V::PackUs16(average(first, second), average(first + kPixels, second + kPixels))));
-        });
+        const auto bytes = [](Vec low, Vec high) { return V::ExchangeMiddle(V::PackUs16(low, high)); };
+        const ptrdiff_t done =
+            width >= 2 * kPixels
+                ? ForBlocks(
+                      width, 2 * kPixels,
+                      [&](ptrdiff_t x) { V::Store(target + x / 2, bytes(average(x), average(x + kPixels))); })
+                : ForBlocks(width, kPixels, [&](ptrdiff_t x) {
+                      const Vec averages = average(x);
+                      V::StoreHalf(target + x / 2, bytes(averages, averages));
+                  });
         if (done < width)
             Rest(done).halve(target + done / 2, Advance(source, done), width - done);
     }
 
     [[gnu::flatten]] static void Doubled(RowPair<uint8_t> target, const uint8_t* source, ptrdiff_t width) {
-        const ptrdiff_t done = ForBlocks(width, kPixels, [&](ptrdiff_t x) {
-            const Vec samples = V::Load(source + x);
-            StoreInterleaved(target.first + 2 * x, samples, samples);
-            StoreInterleaved(target.second + 2 * x, samples, samples);
-        });
+        const ptrdiff_t done = width >= kPixels
+                                   ? ForBlocks(width, kPixels,
+                                               [&](ptrdiff_t x) {
+                                                   const Vec samples = V::Load(source + x);
+                                                   StoreInterleaved(target.first + 2 * x, samples, samples);
+                                                   StoreInterleaved(target.second + 2 * x, samples, samples);
+                                               })
+                                   : ForBlocks(width, kPixels / 2, [&](ptrdiff_t x) {
+                                         const Vec twice = V::LoadAlternating(source + x, source + x);
+                                         V::Store(target.first + 2 * x, twice);
+                                         V::Store(target.second + 2 * x, twice);
+                                     });
         if (done < width)
             Rest(done).doubled(Advance(target, 2 * done), source + done, width - done);
     }

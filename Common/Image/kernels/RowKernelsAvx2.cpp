@@ -94,6 +94,7 @@ struct Avx2 {
 
     static void Store(uint8_t* p, Vec a) { _mm256_storeu_si256(reinterpret_cast<Vec*>(p), a); }
     static void StoreLane(uint8_t* p, __m128i a) { _mm_storeu_si128(reinterpret_cast<__m128i*>(p), a); }
+    static void StoreHalf(uint8_t* p, Vec a) { StoreLane(p, LowLane(a)); }
     static void StoreHalves(uint8_t* low, uint8_t* high, Vec a) {
         StoreLane(low, LowLane(a));
         StoreLane(high, HighLane(a));
@@ -128,6 +129,7 @@ struct Avx2Large : Avx2 {
         StoreLane(p, LowLane(a));
         StoreLane(p + 16, HighLane(a));
     }
+    static void StoreHalf(uint8_t* p, Vec a) { StoreLane(p, LowLane(a)); }
     static void StoreHalves(uint8_t* low, uint8_t* high, Vec a) {
         StoreLane(low, LowLane(a));
         StoreLane(high, HighLane(a));

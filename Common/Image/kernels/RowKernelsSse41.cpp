@@ -28,9 +28,10 @@ struct Sse41 {
         for (size_t i = 0; i < kParts; ++i)
             Store(p + 16 * i, parts[i]);
     }
+    static void StoreHalf(uint8_t* p, Vec a) { _mm_storel_epi64(reinterpret_cast<Vec*>(p), a); }
     static void StoreHalves(uint8_t* low, uint8_t* high, Vec a) {
-        _mm_storel_epi64(reinterpret_cast<Vec*>(low), a);
-        _mm_storel_epi64(reinterpret_cast<Vec*>(high), _mm_unpackhi_epi64(a, a));
+        StoreHalf(low, a);
+        StoreHalf(high, _mm_unpackhi_epi64(a, a));
     }
 
     static void FinishRow() {}
