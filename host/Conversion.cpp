@@ -10,6 +10,7 @@
 #include <cmath>
 #include <filesystem>
 #include <fmt/format.h>
+#include <limits>
 
 namespace host {
 namespace {
@@ -195,10 +196,16 @@ void Conversion::Suspend() {
     clock_.Skip(Now());
 }
 
+/// Seconds converted when the movie is at `position`. A picture can reach beyond the length that was asked
+/// for, and a movie beyond the one it announces.
+double Conversion::Converted(double position) const {
+    return std::clamp(position, 0.0, options_.length ? length_ : std::numeric_limits<double>::max());
+}
+
 ProgressReport Conversion::Figures() {
     ProgressReport report{};
     // While the rest of the sound is converted after the last picture, only the sound tells how far it is.
-    report.position = std::clamp(std::max(position_.load(), movie_.SoundSeconds()), 0.0, length_);
+    report.position = Converted(std::max(position_.load(), movie_.SoundSeconds()));
     report.length = length_;
     report.worked = clock_.Seconds();
     speed_.Add(report.worked, report.position);
@@ -242,7 +249,7 @@ ExitCode Conversion::Conclude() {
                : userStopped_ && outcome_ == kOutcomeStopped ? ExitCode::kStopped
                                                              : ExitCode::kDone;
     end.outcome = failure ? "failed" : end.code == ExitCode::kStopped ? "stopped" : "done";
-    end.position = std::min(position_.load(), length_);
+    end.position = Converted(position_);
     end.worked = clock_.Seconds();
     end.bytes = files_.Bytes();
     end.files = files_.Complete();

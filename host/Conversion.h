@@ -55,6 +55,7 @@ private:
     void ReportProgress();
     ExitCode Conclude();
     std::optional<Failure> Verdict();
+    double Converted(double position) const;
     bool EndedEarly() const;
     void ReportComplaints();
 
