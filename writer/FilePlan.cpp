@@ -18,6 +18,7 @@ namespace {
 constexpr int kDefaultVideoBitrate = 512'000;
 constexpr int kDefaultAudioBitrate = 128'000;
 constexpr double kDefaultFrameRate = 25.0;
+constexpr double kLeastFrameRate = 0.0001; // what is below is no rate, as in the engine
 constexpr double kMostFrameRate = 1000.0;
 constexpr unsigned kMostThreads = 8;
 
@@ -28,7 +29,7 @@ Number FirstPositive(Number first, Number second, Number last) {
 }
 
 double UsableRate(double rate) {
-    return std::isfinite(rate) && rate > 0.0 ? std::min(rate, kMostFrameRate) : 0.0;
+    return std::isfinite(rate) && rate > kLeastFrameRate ? std::min(rate, kMostFrameRate) : 0.0;
 }
 
 bool SameRate(double one, double other) {

@@ -46,6 +46,11 @@ bool IsFragmented(const FilePlan& plan) {
     return plan.container->kind == ContainerKind::kFragmented;
 }
 
+/// Whether the file cannot be finished without a packet of sound, which describes the codec.
+bool NeedsSound(const FilePlan& plan) {
+    return IsFragmented(plan) && plan.audio && plan.audio->codec->id == AV_CODEC_ID_AC3;
+}
+
 EncoderFlags FlagsFor(const FilePlan& plan) {
     const AVOutputFormat* format = av_guess_format(plan.container->muxer, nullptr, nullptr);
     return {format != nullptr && (format->flags & AVFMT_GLOBALHEADER) != 0, plan.bitExact};
@@ -112,7 +117,7 @@ void MediaFile::OpenStages() {
     }
     if (plan_.audio) {
         const bool fills_start = plan_.container->kind == ContainerKind::kSteadyRate;
-        sound_ = std::make_unique<SoundStage>(*plan_.audio, flags, fills_start);
+        sound_ = std::make_unique<SoundStage>(*plan_.audio, flags, fills_start, NeedsSound(plan_));
         const AVCodecContext& encoder = sound_->Encoder();
         soundStream_ =
             AddEncoder(*muxer_, encoder, {1, encoder.sample_rate}, {0, 1}, encoder.initial_padding);
@@ -283,6 +288,8 @@ void MediaFile::DrainStages() {
     } catch (...) {
         Fail(std::current_exception());
     }
+    if (NeedsSound(plan_) && !record_->Failed())
+        StartSoundIfKnown();
     if (pictures_)
         pictures_->Finish();
     if (sound_)

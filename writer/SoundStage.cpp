@@ -13,10 +13,14 @@ namespace {
 constexpr size_t kMostBlocks = 20;
 constexpr size_t kMostBytes = size_t{16} << 20;
 
+/// Samples of silence before late sound that are held at a time.
+constexpr int64_t kSilenceAtOnce = 65536;
+
 } // namespace
 
-SoundStage::SoundStage(const AudioPlan& plan, EncoderFlags flags, bool fillsStart)
+SoundStage::SoundStage(const AudioPlan& plan, EncoderFlags flags, bool fillsStart, bool neverEmpty)
     : fillsStart_(fillsStart),
+      neverEmpty_(neverEmpty),
       encoder_(*plan.codec, plan.settings, flags),
       converter_(Encoder().sample_rate, Encoder().ch_layout, Encoder().sample_fmt),
       queue_(kMostBlocks, kMostBytes,
@@ -52,18 +56,25 @@ void SoundStage::Join() {
 
 void SoundStage::Run(int64_t start) {
     int64_t shift = av_rescale(start, Encoder().sample_rate, kUnitsPerSecond);
-    if (fillsStart_)
-        converter_.PushSilence(std::exchange(shift, 0));
+    int64_t silence = fillsStart_ ? std::exchange(shift, 0) : 0;
     const PacketTaker take = [this, shift](AVPacket& packet) {
         packet.pts += shift;
         packet.dts += shift;
         take_(packet);
     };
+    while (silence > 0 && !cancelled_) {
+        const int64_t part = std::min(silence, kSilenceAtOnce);
+        converter_.PushSilence(part);
+        EncodeAvailable(encoder_.FrameSize(), take);
+        silence -= part;
+    }
     while (const std::optional<SoundBlock> block = queue_.Pop()) {
         converter_.Push(block->format, block->data.data(), block->data.size());
         EncodeAvailable(encoder_.FrameSize(), take);
     }
     converter_.Finish();
+    if (neverEmpty_ && empty_ && converter_.Available() == 0)
+        converter_.PushSilence(1);
     EncodeAvailable(1, take);
     encoder_.Finish(take);
 }
@@ -74,6 +85,7 @@ void SoundStage::EncodeAvailable(int least, const PacketTaker& take) {
         const av::Frame frame = converter_.Take(std::min(converter_.Available(), encoder_.FrameSize()));
         const int samples = frame->nb_samples;
         encoder_.Encode(*frame, take);
+        empty_ = false;
         encoded_(samples);
     }
 }

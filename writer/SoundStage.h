@@ -8,6 +8,7 @@
 #include "writer/PictureStage.h"
 #include "writer/SoundConverter.h"
 
+#include <atomic>
 #include <cstdint>
 #include <functional>
 #include <thread>
@@ -24,8 +25,9 @@ struct SoundBlock {
 class SoundStage {
 public:
     /// Opens the encoder; throws WriterFailure. `fillsStart`: sound that begins late is preceded by silence,
-    /// for containers in which every stream begins at 0.
-    SoundStage(const AudioPlan& plan, EncoderFlags flags, bool fillsStart);
+    /// for containers in which every stream begins at 0. `neverEmpty`: where there is no sound at all, one
+    /// silent sample takes its place.
+    SoundStage(const AudioPlan& plan, EncoderFlags flags, bool fillsStart, bool neverEmpty);
     SoundStage(const SoundStage&) = delete;
     SoundStage& operator=(const SoundStage&) = delete;
     ~SoundStage();
@@ -45,7 +47,10 @@ public:
     void Finish() { queue_.Finish(); }
 
     /// Ends the stage at once; what it holds is dropped.
-    void Cancel() { queue_.Close(); }
+    void Cancel() {
+        cancelled_ = true;
+        queue_.Close();
+    }
 
     /// Waits for the thread.
     void Join();
@@ -55,9 +60,12 @@ private:
     void EncodeAvailable(int least, const PacketTaker& take);
 
     const bool fillsStart_;
+    const bool neverEmpty_;
+    bool empty_ = true;
     AudioEncoder encoder_;
     SoundConverter converter_;
     BoundedQueue<SoundBlock> queue_;
+    std::atomic<bool> cancelled_{false};
     PacketTaker take_;
     Encoded encoded_;
     std::thread thread_;

@@ -3,6 +3,7 @@
 #include "writer/MediaTime.h"
 
 #include <algorithm>
+#include <cstdlib>
 
 namespace writer {
 namespace {
@@ -13,6 +14,20 @@ constexpr int64_t kLongestWait = 10 * kUnitsPerSecond;
 /// How far ahead of all sound a picture can be and still be on the sound's timeline: sound is always written
 /// first.
 constexpr int64_t kFarthestAhead = kUnitsPerSecond / 2;
+
+/// The longest that one picture stands, or sound begins before or after the pictures. A stamp that says more
+/// is wrong: following it could take a file of any size.
+constexpr int64_t kLongestGap = int64_t{6} * 3600 * kUnitsPerSecond;
+
+/// Distance of two stamps. Stamps can be anything; one that is farther off than times can add up to is wrong
+/// anyway.
+int64_t Step(int64_t from, int64_t to) {
+    constexpr int64_t kFarthest = int64_t{1} << 60;
+    int64_t step = 0;
+    if (__builtin_sub_overflow(to, from, &step))
+        step = to > from ? kFarthest : -kFarthest;
+    return std::clamp(step, -kFarthest, kFarthest);
+}
 
 } // namespace
 
@@ -55,7 +70,11 @@ void StampNormaliser::Finish() {
 int64_t StampNormaliser::PlaceFirst(int64_t stamp) {
     int64_t time = 0;
     if (reference_) {
-        time = reference_->position + (stamp - reference_->stamp);
+        time = reference_->position + Step(reference_->stamp, stamp);
+        if (std::abs(time) > kLongestGap) {
+            time = 0;
+            ++repairs_;
+        }
         if (!soundStart_)
             soundStart_ = std::max<int64_t>(0, -time);
     } else if (SoundLength() > 0) {
@@ -71,12 +90,13 @@ int64_t StampNormaliser::PlaceNext(int64_t stamp, const Picture& before) {
             soundStart_ = std::max<int64_t>(0, continued - SoundLength());
         return continued;
     }
-    const int64_t from_start = reference_->position + (stamp - reference_->stamp);
+    const int64_t from_start = reference_->position + Step(reference_->stamp, stamp);
     if (!soundStart_) {
         // The first picture after sound in this file; those before carried another timeline, so its own step
         // is unknown.
         const int64_t time = before.time + pictureLength_;
-        soundStart_ = std::max<int64_t>(0, time - from_start);
+        const int64_t gap = time - from_start;
+        soundStart_ = gap > kLongestGap ? 0 : std::max<int64_t>(0, gap);
         ++repairs_;
         return time;
     }
@@ -95,8 +115,8 @@ int64_t StampNormaliser::PlaceNext(int64_t stamp, const Picture& before) {
 /// The time that keeps the picture's step from the one before; a step that cannot be is replaced by the usual
 /// one.
 int64_t StampNormaliser::Continue(int64_t stamp, const Picture& before) const {
-    const int64_t step = stamp - before.stamp;
-    return before.time + (step > 0 ? step : pictureLength_);
+    const int64_t step = Step(before.stamp, stamp);
+    return before.time + (step > 0 && step <= kLongestGap ? step : pictureLength_);
 }
 
 } // namespace writer

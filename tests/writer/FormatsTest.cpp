@@ -101,6 +101,23 @@ TEST_P(Formats, AreReadBackComplete) {
     EXPECT_EQ(status.llPicturesWritten, movie.hasVideo ? 30 : 0);
 }
 
+// A source can announce sound and have none.
+TEST_P(Formats, KeepPicturesWithoutSound) {
+    const TemporaryFolder folder;
+    TestMovie movie;
+    movie.pictures = 5;
+    movie.soundSeconds = 0;
+    movie.param.fccFileFormat = GetParam().format;
+    movie.param.fccVideo = GetParam().video;
+    movie.param.fccAudio = GetParam().audio;
+    if (GetParam().video == 0)
+        GTEST_SKIP() << "carries no pictures";
+    ASSERT_TRUE(movie.Write(folder.Path("movie")));
+    const ReadMovie read = ReadMovieFile(folder.Path("movie"));
+    EXPECT_TRUE(read.readable);
+    EXPECT_EQ(read.pictures.size(), 5U);
+}
+
 INSTANTIATE_TEST_SUITE_P(All, Formats, testing::ValuesIn(AllPairs()), Name);
 
 } // namespace
