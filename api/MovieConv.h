@@ -1,26 +1,27 @@
-// The interface of MovieConv, the one header that a host includes.
-//
-// A converter takes the pictures and the sound of one opened movie from two decoders of the host, puts both
-// on one timeline and has the media writer make a file of them, or a series of clips, on a worker thread of
-// its own:
-//
-//     MCHandle converter = MCCreate(video, audio);
-//     MCSetOutputFile(converter, L"/tmp/out.mp4");
-//     MCStart(converter, 0.0, 0.0, NULL, callback, context);
-//     MCWait(converter, MC_INFINITE);
-//     MCDestroy(converter);
-//
-// The MC functions are C. Behind them follows what only C++ can use: the decoders that a host derives its own
-// from, helpers, and the colour routines.
-//
-// Threads. A converter belongs to the host's thread that made it. MCPause, MCResume, MCAbort, MCStop, MCWait,
-// MCEnablePreview, MCGetEncodeParam and the MCGet... queries may be called from any thread and at any time
-// between MCCreate and MCDestroy; everything else while the converter does not run. The progress callback
-// comes on the worker thread. It may call whatever does not wait for that thread: not MCStop, MCWait or
-// MCDestroy.
-//
-// Errors. A null handle does nothing and gives 0, from MCStart and MCWait -1. So does a lack of memory. No
-// exception leaves these functions, and none may come out of a decoder or a callback.
+/// \file
+/// The interface of MovieConv, the one header that a host includes.
+///
+/// A converter takes the pictures and the sound of one opened movie from two decoders of the host, puts both
+/// on one timeline and has the media writer make a file of them, or a series of clips, on a worker thread of
+/// its own:
+///
+///     MCHandle converter = MCCreate(video, audio);
+///     MCSetOutputFile(converter, L"/tmp/out.mp4");
+///     MCStart(converter, 0.0, 0.0, NULL, callback, context);
+///     MCWait(converter, MC_INFINITE);
+///     MCDestroy(converter);
+///
+/// The MC functions are C. Behind them follows what only C++ can use: the decoders that a host derives its
+/// own from, helpers, and the colour routines.
+///
+/// Threads. A converter belongs to the host's thread that made it. MCPause, MCResume, MCAbort, MCStop,
+/// MCWait, MCEnablePreview, MCGetEncodeParam and the MCGet... queries may be called from any thread and at
+/// any time between MCCreate and MCDestroy; everything else while the converter does not run. The progress
+/// callback comes on the worker thread. It may call whatever does not wait for that thread: not MCStop,
+/// MCWait or MCDestroy.
+///
+/// Errors. A null handle does nothing and gives 0, from MCStart and MCWait -1. So does a lack of memory. No
+/// exception leaves these functions, and none may come out of a decoder or a callback.
 #ifndef MOVIECONV_API_MOVIECONV_H
 #define MOVIECONV_API_MOVIECONV_H
 

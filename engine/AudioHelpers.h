@@ -1,4 +1,5 @@
-// Helpers for a host that plays or inspects the source's sound itself. No conversion uses them.
+/// \file
+/// Helpers for a host that plays or inspects the source's sound itself. No conversion uses them.
 #ifndef MOVIECONV_ENGINE_AUDIOHELPERS_H
 #define MOVIECONV_ENGINE_AUDIOHELPERS_H
 

@@ -1,4 +1,5 @@
-// Events for the application's main thread.
+/// \file
+/// Events for the application's main thread.
 #ifndef MOVIECONV_ENGINE_POSTMESSAGE_H
 #define MOVIECONV_ENGINE_POSTMESSAGE_H
 

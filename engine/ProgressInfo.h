@@ -1,4 +1,5 @@
-// What the progress callback is told: the record handed to it, and the ways in which a conversion ends.
+/// \file
+/// What the progress callback is told: the record handed to it, and the ways in which a conversion ends.
 #ifndef MOVIECONV_ENGINE_PROGRESSINFO_H
 #define MOVIECONV_ENGINE_PROGRESSINFO_H
 

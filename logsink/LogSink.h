@@ -1,5 +1,6 @@
-// The log sink library, quennet.dylib: every line that it is given becomes one line of UTF-8. Both functions
-// may be called from any thread.
+/// \file
+/// The log sink library, quennet.dylib: every line that it is given becomes one line of UTF-8. Both functions
+/// may be called from any thread.
 #ifndef MOVIECONV_LOGSINK_LOGSINK_H
 #define MOVIECONV_LOGSINK_LOGSINK_H
 

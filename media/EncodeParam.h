@@ -1,5 +1,6 @@
-// The encoding parameters that cross the exported interface and reach the media writer, and the writer's
-// table of file formats. Both records have the same layout in every build.
+/// \file
+/// The encoding parameters that cross the exported interface and reach the media writer, and the writer's
+/// table of file formats. Both records have the same layout in every build.
 #ifndef MOVIECONV_MEDIA_ENCODEPARAM_H
 #define MOVIECONV_MEDIA_ENCODEPARAM_H
 

@@ -1,4 +1,5 @@
-// Four-character codes: 32-bit values whose bytes, in memory order, are the four characters.
+/// \file
+/// Four-character codes: 32-bit values whose bytes, in memory order, are the four characters.
 #ifndef MOVIECONV_MEDIA_FOURCC_H
 #define MOVIECONV_MEDIA_FOURCC_H
 

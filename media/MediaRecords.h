@@ -1,5 +1,6 @@
-// The records that pass from the host's decoders through the engine to the media writer. They are packed to 4
-// bytes, so that a 64-bit build has the 32-bit layout with its pointers widened and nothing else moved.
+/// \file
+/// The records that pass from the host's decoders through the engine to the media writer. They are packed to
+/// 4 bytes, so that a 64-bit build has the 32-bit layout with its pointers widened and nothing else moved.
 #ifndef MOVIECONV_MEDIA_MEDIARECORDS_H
 #define MOVIECONV_MEDIA_MEDIARECORDS_H
 
@@ -31,13 +32,13 @@ typedef struct AudioFormat {
 /// Host-owned description of the picture source. The engine reads `format` only.
 typedef struct VideoSourceInfo {
     unsigned char host[1036]; ///< The host's own.
-    VideoFormat format;
+    VideoFormat format;       ///< The figures of the pictures.
 } VideoSourceInfo;
 
 /// Host-owned description of the sound source. The engine reads `format` only.
 typedef struct AudioSourceInfo {
     unsigned char host[1080]; ///< The host's own.
-    AudioFormat format;
+    AudioFormat format;       ///< The figures of the sound.
 } AudioSourceInfo;
 
 enum {

@@ -1,7 +1,8 @@
-// The media-writer library, orvex.dylib: five functions that encode and multiplex one output file.
-//
-// The engine calls all of them but MWGetFileFormatInfos on its worker thread, one call at a time for a
-// handle. Records are read during the call only.
+/// \file
+/// The media-writer library, orvex.dylib: five functions that encode and multiplex one output file.
+///
+/// The engine calls all of them but MWGetFileFormatInfos on its worker thread, one call at a time for a
+/// handle. Records are read during the call only.
 #ifndef MOVIECONV_MEDIA_MEDIAWRITER_H
 #define MOVIECONV_MEDIA_MEDIAWRITER_H
 

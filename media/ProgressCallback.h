@@ -1,4 +1,5 @@
-// The host's progress callback, which the engine calls and hands on to the media writer's final close.
+/// \file
+/// The host's progress callback, which the engine calls and hands on to the media writer's final close.
 #ifndef MOVIECONV_MEDIA_PROGRESSCALLBACK_H
 #define MOVIECONV_MEDIA_PROGRESSCALLBACK_H
 

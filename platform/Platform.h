@@ -1,9 +1,10 @@
-// The event-queue and bundle functions that the engine expects of its platform, and what a host needs to
-// receive the events. They have their usual names, signatures and error codes. Every function may be called
-// from any thread.
-//
-// Ownership follows the usual rule: what a function with Create or Copy in its name gives out, or what was
-// retained, is the caller's to release; what a function with Get in its name gives out is borrowed.
+/// \file
+/// The event-queue and bundle functions that the engine expects of its platform, and what a host needs to
+/// receive the events. They have their usual names, signatures and error codes. Every function may be called
+/// from any thread.
+///
+/// Ownership follows the usual rule: what a function with Create or Copy in its name gives out, or what was
+/// retained, is the caller's to release; what a function with Get in its name gives out is borrowed.
 #ifndef MOVIECONV_PLATFORM_PLATFORM_H
 #define MOVIECONV_PLATFORM_PLATFORM_H
 
@@ -13,38 +14,39 @@
 extern "C" {
 #endif
 
-typedef unsigned char Boolean;
-typedef uint32_t UInt32;
-typedef int16_t SInt16;
-typedef int32_t OSStatus;
+typedef unsigned char Boolean; ///< 0 or 1.
+typedef uint32_t UInt32;       ///< 32 bits.
+typedef int16_t SInt16;        ///< 16 bits with a sign.
+typedef int32_t OSStatus;      ///< noErr, or what went wrong.
 typedef uint32_t OSType; ///< Four characters, the first in the highest byte, as a literal of 'abcd' has them.
-typedef unsigned long ByteCount;
-typedef unsigned long ItemCount;
+typedef unsigned long ByteCount; ///< A size in bytes.
+typedef unsigned long ItemCount; ///< A number of things.
 
 /// A window of the host. The engine hands references to it on and never looks inside.
 typedef struct OpaqueWindowPtr OpaqueWindowPtr;
 
-typedef struct OpaqueEventRef* EventRef;
-typedef struct OpaqueEventQueueRef* EventQueueRef;
-typedef double EventTime;    ///< Seconds since the system started; 0 stands for now.
-typedef double EventTimeout; ///< Seconds.
-typedef UInt32 EventAttributes;
-typedef OSType EventParamName;
-typedef OSType EventParamType;
-typedef SInt16 EventPriority;
+typedef struct OpaqueEventRef* EventRef;           ///< A counted reference to an event.
+typedef struct OpaqueEventQueueRef* EventQueueRef; ///< A queue of events.
+typedef double EventTime;                          ///< Seconds since the system started; 0 stands for now.
+typedef double EventTimeout;                       ///< Seconds.
+typedef UInt32 EventAttributes;                    ///< Not used.
+typedef OSType EventParamName;                     ///< Which parameter of an event.
+typedef OSType EventParamType;                     ///< What its bytes are.
+typedef SInt16 EventPriority;                      ///< kEventPriority...
 
+/// One kind of events.
 typedef struct EventTypeSpec {
-    OSType eventClass;
-    UInt32 eventKind;
+    OSType eventClass; ///< The class.
+    UInt32 eventKind;  ///< The kind within the class.
 } EventTypeSpec;
 
-typedef const void* CFTypeRef;
-typedef const struct OpaqueCFAllocator* CFAllocatorRef;
-typedef struct OpaqueCFBundle* CFBundleRef;
-typedef const struct OpaqueCFURL* CFURLRef;
-typedef const struct OpaqueCFString* CFStringRef;
-typedef long CFIndex;
-typedef UInt32 CFStringEncoding;
+typedef const void* CFTypeRef;                          ///< Any of the references below.
+typedef const struct OpaqueCFAllocator* CFAllocatorRef; ///< Not used; null.
+typedef struct OpaqueCFBundle* CFBundleRef;             ///< A program with what belongs to it.
+typedef const struct OpaqueCFURL* CFURLRef;             ///< A place.
+typedef const struct OpaqueCFString* CFStringRef;       ///< A text.
+typedef long CFIndex;                                   ///< A count or size.
+typedef UInt32 CFStringEncoding;                        ///< How a text is kept in bytes.
 
 enum {
     noErr = 0,
@@ -63,9 +65,9 @@ enum {
     typeWildCard = 0x2A2A2A2A ///< '****': any type will do.
 };
 
-#define kEventDurationNoWait 0.0
-#define kEventDurationForever (-1.0)
-#define kCFStringEncodingUTF8 ((CFStringEncoding)0x08000100)
+#define kEventDurationNoWait 0.0                             ///< An EventTimeout: do not wait.
+#define kEventDurationForever (-1.0)                         ///< An EventTimeout: wait without limit.
+#define kCFStringEncodingUTF8 ((CFStringEncoding)0x08000100) ///< UTF-8, the only encoding.
 
 #pragma GCC visibility push(default)
 

@@ -1,9 +1,10 @@
-// The media writer's second header: what the five functions of media/MediaWriter.h have no room for. A host
-// sets options here before a conversion, and learns here how each file stands and what went wrong. The engine
-// needs none of it.
-//
-// All functions may be called on any thread. Texts are UTF-8; bytes of a file name that are not UTF-8 stand
-// as they are.
+/// \file
+/// The media writer's second header: what the five functions of media/MediaWriter.h have no room for. A host
+/// sets options here before a conversion, and learns here how each file stands and what went wrong. The
+/// engine needs none of it.
+///
+/// All functions may be called on any thread. Texts are UTF-8; bytes of a file name that are not UTF-8 stand
+/// as they are.
 #ifndef MOVIECONV_WRITER_WRITERSTATUS_H
 #define MOVIECONV_WRITER_WRITERSTATUS_H
 
@@ -69,7 +70,7 @@ typedef struct WriterStatus {
     int32_t nSampleRate;   ///< Sample rate in the file: the nearest that the codec takes. 0 without sound.
     int32_t nAudioBitrate; ///< Sound bit rate in use, after the codec's limits; 0 for codecs without one.
     int32_t nWidth;        ///< Picture size in the file; 0 without pictures.
-    int32_t nHeight;
+    int32_t nHeight;       ///< Likewise.
 
     char szWhat[kWriterTextSize];          ///< What went wrong, a sentence for users; empty when nothing did.
     char szPath[kWriterPathSize];          ///< The target as the engine named it.
@@ -101,11 +102,11 @@ typedef int (*WriterFullDiskHandler)(void* context, const WriterStatus* status);
 /// Options for the files created from now on; all zero is the default.
 typedef struct WriterOptions {
     int32_t nSampleAspectNum; ///< Shape of the source's pixels, width to height; 0 or 0:0 counts as 1:1.
-    int32_t nSampleAspectDen;
-    int32_t bFullRange;      ///< Nonzero: luma covers 0 to 255, not 16 to 235.
-    int32_t nColorPrimaries; ///< As in ISO/IEC 23091-2; 0 or 2: not stated.
-    int32_t nColorTransfer;  ///< As in ISO/IEC 23091-2; 0 or 2: not stated.
-    int32_t nColorMatrix;    ///< As in ISO/IEC 23091-2; 0 or 2: not stated.
+    int32_t nSampleAspectDen; ///< The height of that proportion.
+    int32_t bFullRange;       ///< Nonzero: luma covers 0 to 255, not 16 to 235.
+    int32_t nColorPrimaries;  ///< As in ISO/IEC 23091-2; 0 or 2: not stated.
+    int32_t nColorTransfer;   ///< As in ISO/IEC 23091-2; 0 or 2: not stated.
+    int32_t nColorMatrix;     ///< As in ISO/IEC 23091-2; 0 or 2: not stated.
     /// Threads of the picture encoder; 0: one, or for H.264, HEVC, VP8 and VP9 one a processor, 8 at most.
     /// The number may change the output, timing never does.
     int32_t nEncoderThreads;

@@ -1,32 +1,29 @@
-// Colour conversion between packed RGB, packed YUV 4:2:2 and planar YUV 4:2:0, in integer arithmetic with
-// results that are the same in every bit on every processor.
-//
-// Layouts
-//   RGB      3 or 4 bytes a pixel in memory order blue, green, red (, fourth byte).
-//            A bitmap that a header describes has rows of 3 * width bytes rounded up to a multiple of 4 (24
-//            bits), or of 4 * width bytes (32 bits). "Bottom-up": the first row in memory is the bottom row
-//            of the picture; "top-down": it is the top row.
-//   4:2:0    three planes of bytes, Y at full size, U (Cb) and V (Cr) at half width and half height, rounded
-//   up; row 0 is
-//            the top. Every plane has its own pitch: the bytes from one row to the next.
-//   4:2:2    2 bytes a pixel; the pixels 2k and 2k + 1 share a group of four bytes. bYUY2 nonzero: Y0 U Y1 V,
-//   zero:
-//            U Y0 V Y1. Pixel x of a row starts at byte 2 * x, rows count from the top.
-// Colours are ITU-R BT.601 studio range: Y 16 to 235, U and V 16 to 240 around 128.
-//
-// Rules that hold for all of them
-//   - Sources are only read, destinations only written, and they must not overlap. No byte outside the pixels
-//   concerned is
-//     read or written: neither row padding nor what lies behind a row or a plane.
-//   - Any size works, odd ones too, with any pitch and alignment. Where a block of 2 x 2 pixels is cut by an
-//   odd last
-//     column or row, its chroma is the average of the pixels that exist. A width or height (for the rectangle
-//     routines: a size) of zero or less converts nothing.
-//   - No state, no allocation (but xTraceImage), no errors returned: they may run on any number of threads at
-//   once. A
-//     broken precondition that a routine checks writes "file:line: failed assertion" with the condition to
-//     standard error and aborts, before anything is written unless noted. Only the checks that a routine
-//     names are made.
+/// \file
+/// Colour conversion between packed RGB, packed YUV 4:2:2 and planar YUV 4:2:0, in integer arithmetic with
+/// results that are the same in every bit on every processor.
+///
+/// Layouts:
+/// - RGB: 3 or 4 bytes a pixel in memory order blue, green, red (, fourth byte). A bitmap that a header
+///   describes has rows of 3 * width bytes rounded up to a multiple of 4 (24 bits), or of 4 * width bytes (32
+///   bits). "Bottom-up": the first row in memory is the bottom row of the picture; "top-down": it is the top
+///   row.
+/// - 4:2:0: three planes of bytes, Y at full size, U (Cb) and V (Cr) at half width and half height, rounded
+///   up; row 0 is the top. Every plane has its own pitch: the bytes from one row to the next.
+/// - 4:2:2: 2 bytes a pixel; the pixels 2k and 2k + 1 share a group of four bytes. bYUY2 nonzero: Y0 U Y1 V,
+///   zero: U Y0 V Y1. Pixel x of a row starts at byte 2 * x, rows count from the top.
+///
+/// Colours are ITU-R BT.601 studio range: Y 16 to 235, U and V 16 to 240 around 128.
+///
+/// Rules that hold for all of them:
+/// - Sources are only read, destinations only written, and they must not overlap. No byte outside the pixels
+///   concerned is read or written: neither row padding nor what lies behind a row or a plane.
+/// - Any size works, odd ones too, with any pitch and alignment. Where a block of 2 x 2 pixels is cut by an
+///   odd last column or row, its chroma is the average of the pixels that exist. A width or height (for the
+///   rectangle routines: a size) of zero or less converts nothing.
+/// - No state, no allocation (but xTraceImage), no errors returned: they may run on any number of threads at
+///   once. A broken precondition that a routine checks writes "file:line: failed assertion" with the
+///   condition to standard error and aborts, before anything is written unless noted. Only the checks that a
+///   routine names are made.
 #ifndef MOVIECONV_COMMON_IMAGE_IMAGECONVERT_H
 #define MOVIECONV_COMMON_IMAGE_IMAGECONVERT_H
 
@@ -38,24 +35,24 @@
 /// The bitmap information header of the GDI. The conversions read biWidth and biHeight, the size in pixels,
 /// and, where they check it, biBitCount.
 struct tagBITMAPINFOHEADER {
-    uint32_t biSize;
-    int32_t biWidth;
-    int32_t biHeight;
-    uint16_t biPlanes;
-    uint16_t biBitCount;
-    uint32_t biCompression;
-    uint32_t biSizeImage;
-    int32_t biXPelsPerMeter;
-    int32_t biYPelsPerMeter;
-    uint32_t biClrUsed;
-    uint32_t biClrImportant;
+    uint32_t biSize;         ///< Bytes of the header; not read.
+    int32_t biWidth;         ///< Width in pixels.
+    int32_t biHeight;        ///< Rows; with zero or less nothing is converted.
+    uint16_t biPlanes;       ///< Not read.
+    uint16_t biBitCount;     ///< Bits of a pixel.
+    uint32_t biCompression;  ///< Not read.
+    uint32_t biSizeImage;    ///< Not read.
+    int32_t biXPelsPerMeter; ///< Not read.
+    int32_t biYPelsPerMeter; ///< Not read.
+    uint32_t biClrUsed;      ///< Not read.
+    uint32_t biClrImportant; ///< Not read.
 };
 static_assert(sizeof(tagBITMAPINFOHEADER) == 40 && offsetof(tagBITMAPINFOHEADER, biBitCount) == 14);
 
 /// A header with what follows it in memory.
 struct tagBITMAPINFO {
-    tagBITMAPINFOHEADER bmiHeader;
-    unsigned char bmiColors[4];
+    tagBITMAPINFOHEADER bmiHeader; ///< The header.
+    unsigned char bmiColors[4];    ///< The first bytes behind it.
 };
 static_assert(offsetof(tagBITMAPINFO, bmiColors) == 40);
 
@@ -66,9 +63,8 @@ struct VideoImage;
 #pragma GCC visibility push(default)
 
 // --- RGB to planar 4:2:0
-// --------------------------------------------------------------------------------------------- Every pixel
-// gives its own Y, Cb and Cr, rounded down from 14-bit fixed point; a chroma sample is the truncated average
-// of its pixels' values.
+// Every pixel gives its own Y, Cb and Cr, rounded down from 14-bit fixed point; a chroma sample is the
+// truncated average of its pixels' values.
 
 /// 32-bit bottom-up bitmap; the fourth byte of a pixel is ignored. Checked: a header of 32 bits, no null
 /// pointer.
@@ -111,8 +107,8 @@ void Rgb32_2_yuv420A_R(unsigned char* pY, unsigned char* pU, unsigned char* pV, 
                        int nPt_U, int nPt_V, tagBITMAPINFOHEADER* lpSrcBmi, unsigned char* lpSrcBits);
 
 // --- Planar 4:2:0 to RGB
-// --------------------------------------------------------------------------------------------- A chroma
-// sample serves its 2 x 2 pixels unchanged. 13-bit fixed point, rounded down, clamped to 0 to 255.
+// A chroma sample serves its 2 x 2 pixels unchanged. 13-bit fixed point, rounded down, clamped to 0 to
+// 255.
 
 /// Into a 24-bit bottom-up bitmap; the padding of its rows is not touched. Checked: a header of 24 bits, no
 /// null pointer.
@@ -139,9 +135,8 @@ void Yuv420_2_rgb24Simple(tagBITMAPINFOHEADER* lpDstBmi, unsigned char* lpDstBit
 void PixelYUV_2_RGB(int Y, int U, int V, int& R, int& G, int& B);
 
 // --- Packed 4:2:2
-// ---------------------------------------------------------------------------------------------------- A
-// rectangle of cx x cy pixels goes from (xSrc, ySrc) to (xDst, yDst), pixels from the top left; pitches are
-// in bytes.
+// A rectangle of cx x cy pixels goes from (xSrc, ySrc) to (xDst, yDst), pixels from the top left; pitches
+// are in bytes.
 
 /// 24-bit bottom-up picture of nHeightSrc rows to 4:2:2; a group's chroma is the truncated average of its two
 /// pixels'. Groups are written whole: an odd xDst starts one column to the left, with the pixel xSrc, and
@@ -171,7 +166,6 @@ void Yuv420_2_YUY2(unsigned char* lpBitsDst, int nPitchDst, int xDst, int yDst, 
                    int nPt_U, int nPt_V, int xSrc, int ySrc);
 
 // --- Copies and resampling; nothing is checked
-// -----------------------------------------------------------------------
 
 /// Copies a rectangle of a planar 4:2:0 picture. An odd cy is rounded up, in Y too. Chroma starts at column
 /// (x + 1) / 2 and row y / 2 on each side and is (cx + 1) / 2 wide.
@@ -198,9 +192,8 @@ void YUV420_2_444(unsigned char* pDst, unsigned char* pSrc, int w, int h);
 void YUV420_2_444Ex(unsigned char* pDst, unsigned char* pSrc, int W, int H);
 
 // --- Trace
-// -----------------------------------------------------------------------------------------------------------
-// Convert a picture with Yuv420_2_rgb24 into a bitmap of their own, which is released at once. A size of zero
-// or less, or a bitmap for which there is no memory, converts nothing.
+// Convert a picture with Yuv420_2_rgb24 into a bitmap of their own, which is released at once. A size of
+// zero or less, or a bitmap for which there is no memory, converts nothing.
 
 /// A decoded picture (media/MediaRecords.h); anything but nType 1 returns at once, anything but nFormat 2 is
 /// not converted.
