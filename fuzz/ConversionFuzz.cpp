@@ -59,7 +59,7 @@ public:
         info.format.dFrameRate = WildDouble(input, 25.0);
         info.format.dDuration = WildDouble(input, 1.0);
         int64_t time = WildTime(input, 0);
-        for (size_t i = input.ConsumeIntegralInRange<size_t>(0, kMostRecords); i > 0; --i) {
+        for (auto i = input.ConsumeIntegralInRange<size_t>(0, kMostRecords); i > 0; --i) {
             pictures.push_back(MakePicture(input, time));
             results.push_back(WildInteger(input, 1));
             time = Add(time, kSecond / 25);
@@ -135,7 +135,7 @@ public:
         info.format.nBytesPerSecond = WildInteger(input, 32000);
         info.format.dDuration = WildDouble(input, 1.0);
         int64_t time = WildTime(input, 0);
-        for (size_t i = input.ConsumeIntegralInRange<size_t>(0, kMostRecords); i > 0; --i) {
+        for (auto i = input.ConsumeIntegralInRange<size_t>(0, kMostRecords); i > 0; --i) {
             blocks.push_back(MakeBlock(input, time));
             time = Add(time, kSecond / 20);
         }

@@ -43,7 +43,7 @@ void FuzzReplace(FuzzedDataProvider& input) {
     const auto pattern = Copy(input.ConsumeRandomLengthString(4));
     const char ch = input.ConsumeIntegral<char>();
     const auto text = Copy(input.ConsumeRemainingBytesAsString());
-    if (*pattern.get() == '\0')
+    if (pattern[0] == '\0')
         return;
     const Replaced expected = Replace(text.get(), pattern.get(), ch);
     FUZZ_CHECK(replace_str_2_char(text.get(), pattern.get(), ch) == expected.count);
