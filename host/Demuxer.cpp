@@ -99,8 +99,11 @@ av::Packet Demuxer::Take(int stream) {
     av::Packet packet = std::move(queue.packets.front());
     queue.packets.pop_front();
     queue.bytes -= static_cast<std::size_t>(packet->size);
+    const bool wanted = !Holds(kEnoughPackets / 2, kEnoughBytes / 2); // waking it for each packet costs more
     lock.unlock();
-    changed_.notify_all();
+    if (wanted) {
+        changed_.notify_all();
+    }
     return packet;
 }
 
@@ -133,24 +136,25 @@ int Demuxer::ClockJumps() const {
     return clockJumps_;
 }
 
-bool Demuxer::HasEnough() const {
-    std::size_t bytes = 0;
+/// Whether no queue is empty and each has so many packets, or all together have so many bytes.
+bool Demuxer::Holds(std::size_t packets, std::size_t bytes) const {
+    std::size_t held = 0;
     bool allFilled = true;
     for (const auto& [stream, queue] : queues_) {
         if (queue.packets.empty()) {
             return false;
         }
-        bytes += queue.bytes;
-        allFilled = allFilled && queue.packets.size() >= kEnoughPackets;
+        held += queue.bytes;
+        allFilled = allFilled && queue.packets.size() >= packets;
     }
-    return allFilled || bytes >= kEnoughBytes;
+    return allFilled || held >= bytes;
 }
 
 /// Waits until there is something to read for. False when there is nothing any more.
 bool Demuxer::AwaitDemand() {
     std::unique_lock lock(mutex_);
     WaitAndTell(
-        changed_, lock, [&] { return stopping_ || !HasEnough(); },
+        changed_, lock, [&] { return stopping_ || !Holds(kEnoughPackets, kEnoughBytes); },
         L"Movie::Reading the source waits for the decoders");
     return !stopping_;
 }

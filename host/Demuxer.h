@@ -71,7 +71,7 @@ private:
     bool AwaitDemand();
     bool ReadOne();
     bool KeyPictureAtOrBefore(int64_t mediaTime);
-    bool HasEnough() const;
+    bool Holds(std::size_t packets, std::size_t bytes) const;
     void RepairClock(AVPacket& packet);
 
     Source& source_;

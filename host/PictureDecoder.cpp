@@ -13,6 +13,7 @@ constexpr int kTrialPictures = 40;
 constexpr int kWarmUpPictures = 16;
 constexpr std::size_t kTrialPackets = 400;
 constexpr unsigned kMostThreads = 16;
+constexpr double kBusy = 0.85; // share of the processors from which more threads bring nothing
 
 std::size_t Bytes(const AVFrame& frame) {
     return static_cast<std::size_t>(frame.width) * static_cast<std::size_t>(frame.height) * 3 / 2;
@@ -152,7 +153,9 @@ bool PictureDecoder::Deliver(StampRepair::Stamp stamp) {
         return true;
     }
     first_ = false;
-    if (++pushed_ > kWarmUpPictures && queue_.Size() == 0) {
+    if (++pushed_ == kWarmUpPictures) {
+        use_ = {};
+    } else if (pushed_ > kWarmUpPictures && queue_.Size() == 0) {
         ++starved_;
     }
     const std::size_t bytes = Bytes(*picture);
@@ -160,7 +163,8 @@ bool PictureDecoder::Deliver(StampRepair::Stamp stamp) {
 }
 
 /// One thread decodes at first, which costs the least and is enough for most movies: the encoder is slower.
-/// When the queue keeps running empty, the decoder is the slower one and gets the other processors too.
+/// When the queue keeps running empty, the decoder is the slower one and gets the other processors too, if
+/// the program leaves them idle.
 void PictureDecoder::ConsiderMoreThreads(av::Packet packet) {
     if (!trial_) {
         return;
@@ -171,7 +175,7 @@ void PictureDecoder::ConsiderMoreThreads(av::Packet packet) {
         return;
     }
     const bool runsEmpty = judged <= 0 || starved_ * 2 > judged;
-    if (runsEmpty && std::thread::hardware_concurrency() > 1) {
+    if (runsEmpty && use_.Processors() < kBusy * std::thread::hardware_concurrency()) {
         UseMoreThreads();
     }
     trial_.reset();

@@ -8,6 +8,7 @@
 
 #include "host/Demuxer.h"
 #include "host/PictureConverter.h"
+#include "host/ProcessorUse.h"
 #include "host/StampRepair.h"
 #include "host/StreamDecoder.h"
 #include "media/Decoders.h"
@@ -74,6 +75,7 @@ private:
         trial_; // packets since the start, until the thread count is settled
     int pushed_ = 0;
     int starved_ = 0;
+    ProcessorUse use_; // since the warm-up
     int64_t damagedBefore_ = 0;
 
     // Between the threads.

@@ -20,7 +20,8 @@ struct QueueSides {
     std::chrono::milliseconds limit = kStallLimit;
 };
 
-/// Items in the order they were pushed. All functions may be called on any thread.
+/// Items in the order they were pushed. All functions may be called on any thread. Who waits for room goes on
+/// when the queue is half empty: waking for every single item would cost more than the item.
 template <class Item>
 class BoundedQueue {
 public:
@@ -34,14 +35,14 @@ public:
     bool Push(Item item, std::size_t weight = 0) {
         std::unique_lock lock(mutex_);
         WaitAndTell(
-            changed_, lock, [&] { return finished_ || HasRoom(weight); }, sides_.full, sides_.limit);
+            room_, lock, [&] { return finished_ || HasRoom(weight); }, sides_.full, sides_.limit);
         if (finished_) {
             return false;
         }
         items_.emplace_back(std::move(item), weight);
         weight_ += weight;
         lock.unlock();
-        changed_.notify_all();
+        item_.notify_one();
         return true;
     }
 
@@ -49,15 +50,18 @@ public:
     std::optional<Item> Pop() {
         std::unique_lock lock(mutex_);
         WaitAndTell(
-            changed_, lock, [&] { return finished_ || !items_.empty(); }, sides_.empty, sides_.limit);
+            item_, lock, [&] { return finished_ || !items_.empty(); }, sides_.empty, sides_.limit);
         if (items_.empty()) {
             return std::nullopt;
         }
         std::optional<Item> item(std::move(items_.front().first));
         weight_ -= items_.front().second;
         items_.pop_front();
+        const bool half_empty = items_.size() <= maxItems_ / 2 && weight_ <= maxWeight_ / 2;
         lock.unlock();
-        changed_.notify_all();
+        if (half_empty) {
+            room_.notify_all();
+        }
         return item;
     }
 
@@ -67,7 +71,7 @@ public:
             const std::lock_guard lock(mutex_);
             finished_ = true;
         }
-        changed_.notify_all();
+        WakeAll();
     }
 
     /// Drops what is inside and wakes everyone who waits.
@@ -78,7 +82,7 @@ public:
             items_.clear();
             weight_ = 0;
         }
-        changed_.notify_all();
+        WakeAll();
     }
 
     std::size_t Size() const {
@@ -91,11 +95,17 @@ private:
         return items_.empty() || (items_.size() < maxItems_ && weight_ + weight <= maxWeight_);
     }
 
+    void WakeAll() {
+        room_.notify_all();
+        item_.notify_all();
+    }
+
     const std::size_t maxItems_;
     const std::size_t maxWeight_;
     const QueueSides sides_;
     mutable std::mutex mutex_;
-    std::condition_variable changed_;
+    std::condition_variable room_;
+    std::condition_variable item_;
     std::deque<std::pair<Item, std::size_t>> items_;
     std::size_t weight_ = 0;
     bool finished_ = false;
