@@ -281,15 +281,13 @@ bool MediaFile::Close() {
 void MediaFile::DrainStages() {
     try {
         stamps_.Finish();
-        if (!waiting_.empty() && !record_->Failed()) {
+        if ((!waiting_.empty() || NeedsSound(plan_)) && !record_->Failed()) {
             StartSoundIfKnown();
             PushSound();
         }
     } catch (...) {
         Fail(std::current_exception());
     }
-    if (NeedsSound(plan_) && !record_->Failed())
-        StartSoundIfKnown();
     if (pictures_)
         pictures_->Finish();
     if (sound_)
