@@ -348,7 +348,7 @@ void FuzzRoutine(FuzzedDataProvider& input) {
     }
 }
 
-/// Room for the extents' rows; those of a kernel for large pictures begin at the alignment that it needs.
+/// Room for the extents' rows.
 std::vector<uint8_t*> MakeRows(Memory& memory, const std::vector<Extent>& extents, size_t width,
                                bool target) {
     std::vector<uint8_t*> rows;

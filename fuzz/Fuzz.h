@@ -5,6 +5,7 @@
 #include <cstdint>
 #include <cstdio>
 #include <cstdlib>
+#include <limits>
 
 #include <fuzzer/FuzzedDataProvider.h>
 
@@ -15,7 +16,7 @@
                         std::fprintf(stderr, "%s:%d: not true: %s\n", __FILE__, __LINE__, #condition)),      \
                     std::abort()))
 
-/// Mostly 0 or small, sometimes anywhere in the range, sometimes at its ends.
+/// Mostly `usual`, sometimes anywhere in the range, sometimes small or at its ends.
 template <class Integer>
 Integer WildInteger(FuzzedDataProvider& input, Integer usual) {
     switch (input.ConsumeIntegralInRange(0, 7)) {

@@ -72,10 +72,10 @@ private:
     const bool fragmented_;
     av::Output output_;
     av::Packet packet_;
+    // Whether one has its Turn, which guards everything once the header is written.
+    mutable bool busy_ = false;
     mutable std::mutex mutex_;
     mutable std::condition_variable changed_;
-    mutable bool busy_ =
-        false; ///< Whether one has its Turn; that guards everything once the header is written.
     std::vector<State> streams_;
     bool ended_ = false;
 };
