@@ -367,6 +367,7 @@ void FuzzKernel(FuzzedDataProvider& input) {
     const bool large = input.ConsumeBool();
     const size_t step = large ? size_t{image::kLargeWidthStep} : kernel.widthStep;
     const size_t width = step * input.ConsumeIntegralInRange<size_t>(0, kMostWidth / step);
+    const image::Size size{static_cast<ptrdiff_t>(width), input.ConsumeBool() ? 2 : 1};
     Memory memory(input);
     std::vector<uint8_t> expected;
     for (const image::KernelLevel level : image::kKernelLevels) {
@@ -380,7 +381,7 @@ void FuzzKernel(FuzzedDataProvider& input) {
         });
         if (large && aligned && kernels->large != nullptr)
             kernels = kernels->large;
-        kernel.run(*kernels, targets.data(), sources.data(), static_cast<ptrdiff_t>(width));
+        kernel.run(*kernels, targets.data(), sources.data(), size);
         const std::vector<uint8_t> written = memory.Finish();
         if (level == image::KernelLevel::kPlain)
             expected = written;

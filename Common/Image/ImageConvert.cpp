@@ -23,7 +23,8 @@ Picture MakePicture(uint8_t* bits, int64_t width, int64_t height, int64_t pitch,
     const auto rows = static_cast<ptrdiff_t>(height);
     const auto step = static_cast<ptrdiff_t>(pitch);
     return {order == RowOrder::kBottomUp ? BottomUp(bits, step, rows) : Rows{bits, step},
-            static_cast<ptrdiff_t>(width), rows, pixelBytes};
+            {static_cast<ptrdiff_t>(width), rows},
+            pixelBytes};
 }
 
 Picture Bitmap32(const tagBITMAPINFOHEADER* header, uint8_t* bits, RowOrder order) {
@@ -50,69 +51,51 @@ ptrdiff_t EvenAbove(ptrdiff_t x) {
     return EvenBelow(x + 1);
 }
 
-/// The kernels for packed rows or one plane. From about 8 MB on nothing of them stays in a cache until it is
-/// used.
-const RowKernels& KernelsFor(Rows target, ptrdiff_t width, int64_t bytes) {
-    constexpr int64_t kLargeBytes = int64_t{8} << 20;
+/// The kernels for a packed picture. From about 8 MB on nothing of it stays in a cache until it is
+/// used: a picture of 1920x1080 with four bytes a pixel is large.
+const RowKernels& KernelsFor(const Picture& target) {
+    constexpr int64_t kLargeBytes = 8'000'000;
     const RowKernels& kernels = BestRowKernels();
-    const bool large = bytes >= kLargeBytes && kernels.large != nullptr && width % kLargeWidthStep == 0 &&
-                       target.AlignedTo(kLargeAlignment);
+    const bool large = target.Bytes() >= kLargeBytes && kernels.large != nullptr &&
+                       target.size.width % kLargeWidthStep == 0 && target.rows.AlignedTo(kLargeAlignment);
     return large ? *kernels.large : kernels;
 }
 
-const RowKernels& KernelsFor(const Picture& target) {
-    return KernelsFor(target.rows, target.width, target.Pixels() * target.pixelBytes);
-}
-
 void Convert(To420 RowKernels::*kernel, const Planes420& target, const Picture& source) {
-    const To420 convert = BestRowKernels().*kernel;
-    ForRowPairs(source.height, [&](ptrdiff_t row0, ptrdiff_t row1, ptrdiff_t chroma) {
-        convert(target.y.Targets(row0, row1), target.u[chroma], target.v[chroma],
-                source.rows.Sources(row0, row1), source.width);
-    });
+    (BestRowKernels().*kernel)(target, source.rows, source.size);
 }
 
 void Convert(To420Alpha RowKernels::*kernel, const Planes420& target, Rows alpha, const Picture& source) {
-    const To420Alpha convert = BestRowKernels().*kernel;
-    ForRowPairs(source.height, [&](ptrdiff_t row0, ptrdiff_t row1, ptrdiff_t chroma) {
-        convert(target.y.Targets(row0, row1), target.u[chroma], target.v[chroma], alpha.Targets(row0, row1),
-                source.rows.Sources(row0, row1), source.width);
-    });
-}
-
-void ConvertPairs(From420 convert, const Picture& target, const Planes420& source) {
-    ForRowPairs(target.height, [&](ptrdiff_t row0, ptrdiff_t row1, ptrdiff_t chroma) {
-        convert(target.rows.Targets(row0, row1), source.y.Sources(row0, row1), source.u[chroma],
-                source.v[chroma], target.width);
-    });
+    (BestRowKernels().*kernel)(target, alpha, source.rows, source.size);
 }
 
 void Convert(From420 RowKernels::*kernel, const Picture& target, const Planes420& source) {
-    ConvertPairs(KernelsFor(target).*kernel, target, source);
+    (KernelsFor(target).*kernel)(target.rows, source, target.size);
 }
 
 void Convert(From420 (RowKernels::*kernels)[kPackedOrders], PackedOrder order, const Picture& target,
              const Planes420& source) {
-    ConvertPairs((KernelsFor(target).*kernels)[order], target, source);
+    (KernelsFor(target).*kernels)[order](target.rows, source, target.size);
 }
 
-void Convert(RowToRow (RowKernels::*kernels)[kPackedOrders], PackedOrder order, const Picture& target,
+void Convert(RowsToRows (RowKernels::*kernels)[kPackedOrders], PackedOrder order, const Picture& target,
              Rows source) {
-    const RowToRow convert = (KernelsFor(target).*kernels)[order];
-    for (ptrdiff_t row = 0; row < target.height; ++row)
-        convert(target.rows[row], source[row], target.width);
+    (KernelsFor(target).*kernels)[order](target.rows, source, target.size);
 }
 
-void Double(const Picture& source, Rows target) {
-    const DoubleRow convert = KernelsFor(target, source.width, 4 * source.Pixels()).doubled;
-    for (ptrdiff_t row = 0; row < source.height; ++row)
-        convert(target.Targets(2 * row, 2 * row + 1), source.rows[row], source.width);
+/// Rows that join up as one.
+bool AreJoined(Rows target, Rows source, ptrdiff_t bytes) {
+    return target.step == bytes && source.step == bytes;
 }
 
 void Copy(Rows target, Rows source, ptrdiff_t bytes, ptrdiff_t height) {
-    ForRows(target, source, bytes, height, [](uint8_t* to, const uint8_t* from, ptrdiff_t count) {
-        std::memcpy(to, from, static_cast<size_t>(count));
-    });
+    if (AreJoined(target, source, bytes)) {
+        std::memcpy(target.first, source.first, static_cast<size_t>(bytes * height));
+        return;
+    }
+    constexpr ptrdiff_t kShortRow = 1024;
+    const RowKernels& kernels = bytes < kShortRow ? BestRowKernels() : kPlainKernels;
+    kernels.copy(target, source, {bytes, height});
 }
 
 } // namespace
@@ -245,7 +228,7 @@ void Rgb24_2_YUY2(unsigned char* lpBitsDst, int nPitchDst, int xDst, int yDst, i
     if (cxDst <= 0 || cyDst <= 0)
         return;
     const ptrdiff_t start = EvenBelow(xDst);
-    const Picture target{Rows{lpBitsDst, nPitchDst}.At(yDst, 2 * start), cxDst + (xDst - start), cyDst, 2};
+    const Picture target{Rows{lpBitsDst, nPitchDst}.At(yDst, 2 * start), {cxDst + (xDst - start), cyDst}, 2};
     Convert(&RowKernels::packedFromBgr24, OrderOf(bYUY2), target,
             BottomUp(lpBitsSrc, nPitchSrc, nHeightSrc).At(ySrc, ptrdiff_t{3} * xSrc));
 }
@@ -255,7 +238,8 @@ void YUY2_2_Rgb24(unsigned char* lpBitsDst, int nHeightDst, int nPitchDst, int x
     CHECK_AT(1232, lpBitsDst && lpBitsSrc);
     if (cx <= 0 || cy <= 0)
         return;
-    const Picture target{BottomUp(lpBitsDst, nPitchDst, nHeightDst).At(yDst, ptrdiff_t{3} * xDst), cx, cy, 3};
+    const Picture target{
+        BottomUp(lpBitsDst, nPitchDst, nHeightDst).At(yDst, ptrdiff_t{3} * xDst), {cx, cy}, 3};
     Convert(&RowKernels::bgr24FromPacked, OrderOf(bYUY2), target,
             Rows{lpBitsSrc, nPitchSrc}.At(ySrc, 2 * EvenBelow(xSrc)));
 }
@@ -266,19 +250,24 @@ void YUY2_2_Yuv420(unsigned char* pY, unsigned char* pU, unsigned char* pV, int 
     if (cx <= 0 || cy <= 0)
         return;
     const Planes420 target = MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V).At(xDst, yDst);
-    const To420 kernel = BestRowKernels().packedTo420[OrderOf(bYUY2)];
     const Rows source = Rows{lpBitsSrc, nPitchSrc}.At(ySrc, 2 * EvenBelow(xSrc));
-    const int64_t lastAllowed = (int64_t{ySrc} + cy) * nPt_V;
-    ForRowPairs(EvenAbove(cy), [&](ptrdiff_t row0, ptrdiff_t row1, ptrdiff_t chroma) {
-        // The groups of this pair of rows whose V sample may be written: each is checked before it is.
-        const int64_t firstSample = (int64_t{yDst / 2} + chroma) * nPt_V + xDst / 2;
-        const int64_t groups = EvenAbove(cx) / 2;
-        const int64_t allowed = std::clamp<int64_t>(lastAllowed - firstSample + 1, 0, groups);
-        kernel(target.y.Targets(row0, row1), target.u[chroma], target.v[chroma], source.Sources(row0, row1),
-               static_cast<ptrdiff_t>(2 * allowed));
-        if (allowed < groups)
-            CheckFailed(1452, "(char*)V <= ((char*)pV + (ySrc + cy) * nPt_V)");
-    });
+    const To420 kernel = BestRowKernels().packedTo420[OrderOf(bYUY2)];
+    const Size size{EvenAbove(cx), EvenAbove(cy)};
+    // Each group is checked before it is written: its V sample must not lie behind the last one allowed.
+    const auto groupsAllowed = [&](ptrdiff_t chromaRow) {
+        const int64_t lastSample = (int64_t{ySrc} + cy) * nPt_V;
+        const int64_t firstSample = (int64_t{yDst / 2} + chromaRow) * nPt_V + xDst / 2;
+        return std::clamp<int64_t>(lastSample - firstSample + 1, 0, size.width / 2);
+    };
+    ptrdiff_t chromaRow = 0;
+    while (chromaRow < size.height / 2 && groupsAllowed(chromaRow) == size.width / 2)
+        ++chromaRow;
+    kernel(target, source, {size.width, 2 * chromaRow});
+    if (chromaRow < size.height / 2) {
+        kernel(target.At(0, 2 * chromaRow), source.At(2 * chromaRow, 0),
+               {static_cast<ptrdiff_t>(2 * groupsAllowed(chromaRow)), 2});
+        CheckFailed(1452, "(char*)V <= ((char*)pV + (ySrc + cy) * nPt_V)");
+    }
 }
 
 void Yuv420_2_YUY2(unsigned char* lpBitsDst, int nPitchDst, int xDst, int yDst, int cx, int cy,
@@ -286,8 +275,8 @@ void Yuv420_2_YUY2(unsigned char* lpBitsDst, int nPitchDst, int xDst, int yDst, 
                    int nPt_U, int nPt_V, int xSrc, int ySrc) {
     if (cx <= 0 || cy <= 0)
         return;
-    const Picture target{Rows{lpBitsDst, nPitchDst}.At(yDst, 2 * EvenBelow(xDst)), EvenAbove(cx),
-                         EvenAbove(cy), 2};
+    const Picture target{
+        Rows{lpBitsDst, nPitchDst}.At(yDst, 2 * EvenBelow(xDst)), {EvenAbove(cx), EvenAbove(cy)}, 2};
     Convert(&RowKernels::packedFrom420, OrderOf(bYUY2), target,
             MakePlanes(pY, pU, pV, nPt_Y, nPt_U, nPt_V).At(xSrc, ySrc));
 }
@@ -320,30 +309,26 @@ void YUY2_Blt_fast(unsigned char* lpBitsDst, int nPitchDst, int xDst, int yDst, 
         Copy(target, source, ptrdiff_t{2} * cx, cy);
         return;
     }
-    const RowToRow swap = KernelsFor({target, cx, cy, 2}).swapPacked;
-    ForRows(target, source, 2 * EvenAbove(cx), cy,
-            [swap](uint8_t* to, const uint8_t* from, ptrdiff_t bytes) { swap(to, from, bytes / 2); });
+    const ptrdiff_t width = EvenAbove(cx);
+    const bool joined = AreJoined(target, source, 2 * width);
+    const Size size = joined ? Size{width * cy, 1} : Size{width, cy};
+    KernelsFor({target, size, 2}).swapPacked(target, source, size);
 }
 
 void YUV444_2_420(unsigned char* pDst, unsigned char* pSrc, int cx, int cy) {
     if (cx <= 0 || cy <= 0)
         return;
-    const Rows target{pDst, EvenAbove(cx) / 2};
-    const HalveRows halve = BestRowKernels().halve;
-    const Rows source{pSrc, cx};
-    ForRowPairs(cy, [&](ptrdiff_t row0, ptrdiff_t row1, ptrdiff_t half) {
-        halve(target[half], source.Sources(row0, row1), cx);
-    });
+    BestRowKernels().halve({pDst, EvenAbove(cx) / 2}, {pSrc, cx}, {cx, cy});
 }
 
 void YUV420_2_444(unsigned char* pDst, unsigned char* pSrc, int w, int h) {
     if (w <= 0 || h <= 0)
         return;
-    Double({{pSrc, w}, w, h, 1}, {pDst, ptrdiff_t{2} * w});
+    BestRowKernels().doubled({pDst, ptrdiff_t{2} * w}, {pSrc, w}, {w, h});
 }
 
 void YUV420_2_444Ex(unsigned char* pDst, unsigned char* pSrc, int W, int H) {
     if (W <= 1 || H <= 1)
         return;
-    Double({{pSrc, EvenAbove(W) / 2}, W / 2, H / 2, 1}, {pDst, W});
+    BestRowKernels().doubled({pDst, W}, {pSrc, EvenAbove(W) / 2}, {W / 2, H / 2});
 }

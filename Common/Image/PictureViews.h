@@ -1,30 +1,42 @@
-// How the exported routines see pictures, and the walks over their rows.
+// How routines and kernels see pictures, and the walks over their rows.
+//
+// The kernels of every instruction set call these functions. They are always inlined, so that nothing
+// compiled for one instruction set is shared with another.
 #ifndef MOVIECONV_COMMON_IMAGE_PICTUREVIEWS_H
 #define MOVIECONV_COMMON_IMAGE_PICTUREVIEWS_H
-
-#include "Common/Image/kernels/RowKernels.h"
 
 #include <cstddef>
 #include <cstdint>
 
 namespace image {
 
+/// Two rows that share chroma; the same row twice at the end of an odd height.
+template <class Byte>
+struct RowPair {
+    Byte* first;
+    Byte* second;
+};
+
 /// Rows of a picture or plane from the top: the first byte of row 0, and the signed distance to the next row.
 struct Rows {
     uint8_t* first;
     ptrdiff_t step;
 
-    uint8_t* operator[](ptrdiff_t row) const { return first + row * step; }
+    [[gnu::always_inline]] uint8_t* operator[](ptrdiff_t row) const { return first + row * step; }
 
     bool AlignedTo(ptrdiff_t bytes) const {
         return reinterpret_cast<uintptr_t>(first) % static_cast<uintptr_t>(bytes) == 0 && step % bytes == 0;
     }
 
     /// The same rows beginning at another row and byte.
-    Rows At(ptrdiff_t row, ptrdiff_t byte) const { return {(*this)[row] + byte, step}; }
+    [[gnu::always_inline]] Rows At(ptrdiff_t row, ptrdiff_t byte) const {
+        return {(*this)[row] + byte, step};
+    }
 
-    RowPair<uint8_t> Targets(ptrdiff_t row0, ptrdiff_t row1) const { return {(*this)[row0], (*this)[row1]}; }
-    RowPair<const uint8_t> Sources(ptrdiff_t row0, ptrdiff_t row1) const {
+    [[gnu::always_inline]] RowPair<uint8_t> Targets(ptrdiff_t row0, ptrdiff_t row1) const {
+        return {(*this)[row0], (*this)[row1]};
+    }
+    [[gnu::always_inline]] RowPair<const uint8_t> Sources(ptrdiff_t row0, ptrdiff_t row1) const {
         return {(*this)[row0], (*this)[row1]};
     }
 };
@@ -34,12 +46,18 @@ inline Rows BottomUp(uint8_t* bits, ptrdiff_t pitch, ptrdiff_t height) {
     return {bits + (height - 1) * pitch, -pitch};
 }
 
+/// Columns and rows.
+struct Size {
+    ptrdiff_t width;
+    ptrdiff_t height;
+};
+
 /// A planar 4:2:0 picture.
 struct Planes420 {
     Rows y, u, v;
 
     /// The same picture beginning at a pixel; halves of odd positions round toward zero.
-    Planes420 At(ptrdiff_t column, ptrdiff_t row) const {
+    [[gnu::always_inline]] Planes420 At(ptrdiff_t column, ptrdiff_t row) const {
         return {y.At(row, column), u.At(row / 2, column / 2), v.At(row / 2, column / 2)};
     }
 };
@@ -47,35 +65,24 @@ struct Planes420 {
 /// A packed picture with its size in pixels.
 struct Picture {
     Rows rows;
-    ptrdiff_t width;
-    ptrdiff_t height;
+    Size size;
     ptrdiff_t pixelBytes;
 
-    int64_t Pixels() const { return int64_t{width} * height; }
+    int64_t Bytes() const { return int64_t{size.width} * size.height * pixelBytes; }
 
     /// The picture without an odd last column and row.
-    Picture WholeBlocks() const { return {rows, width & ~ptrdiff_t{1}, height & ~ptrdiff_t{1}, pixelBytes}; }
+    Picture WholeBlocks() const {
+        return {rows, {size.width & ~ptrdiff_t{1}, size.height & ~ptrdiff_t{1}}, pixelBytes};
+    }
 };
 
 /// Calls visit(row0, row1, chromaRow) for every pair of rows. An odd last row comes as a pair with itself:
 /// averaging a row with itself gives exactly the average of the pixels that exist, and writing it twice
 /// writes the same bytes.
 template <class Visit>
-void ForRowPairs(ptrdiff_t height, Visit visit) {
+[[gnu::always_inline]] inline void ForRowPairs(ptrdiff_t height, Visit visit) {
     for (ptrdiff_t row = 0; row < height; row += 2)
         visit(row, row + 1 < height ? row + 1 : row, row / 2);
-}
-
-/// Calls visit(target, source, bytes) for rows of `bytes` bytes that are treated alike, all at once where
-/// they join up.
-template <class Visit>
-void ForRows(Rows target, Rows source, ptrdiff_t bytes, ptrdiff_t height, Visit visit) {
-    if (target.step == bytes && source.step == bytes) {
-        visit(target.first, source.first, bytes * height);
-        return;
-    }
-    for (ptrdiff_t row = 0; row < height; ++row)
-        visit(target[row], source[row], bytes);
 }
 
 } // namespace image

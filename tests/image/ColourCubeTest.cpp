@@ -37,7 +37,8 @@ protected:
                     if constexpr (kPixelBytes == 4)
                         pixel[3] = static_cast<uint8_t>(37 * x);
                 }
-                kernel({y0.data(), y1.data()}, u.data(), v.data(), {row.data(), row.data()}, kWidth);
+                kernel({{y0.data(), y1.data() - y0.data()}, {u.data(), 0}, {v.data(), 0}}, {row.data(), 0},
+                       {kWidth, 2});
                 for (size_t b = 0; b < 256; ++b) {
                     const Yuv want = expect(Rgb{r, g, static_cast<int>(b)});
                     ASSERT_TRUE(y0[2 * b] == want.y && y0[2 * b + 1] == want.y && y1[2 * b] == want.y &&
@@ -57,8 +58,9 @@ protected:
             y[i] = static_cast<uint8_t>(i);
         for (int cb = 0; cb < 256; cb += step) {
             for (int cr = 0; cr < 256; cr += step) {
-                const std::vector<uint8_t> u(kWidth / 2, Byte(cb)), v(kWidth / 2, Byte(cr));
-                kernel({rgb0.data(), rgb1.data()}, {y.data(), y.data()}, u.data(), v.data(), kWidth);
+                std::vector<uint8_t> u(kWidth / 2, Byte(cb)), v(kWidth / 2, Byte(cr));
+                kernel({rgb0.data(), rgb1.data() - rgb0.data()},
+                       {{y.data(), 0}, {u.data(), 0}, {v.data(), 0}}, {kWidth, 2});
                 for (size_t i = 0; i < kWidth; ++i) {
                     const Rgb want = expect(Yuv{static_cast<int>(i), cb, cr});
                     for (const auto* rgb : {&rgb0, &rgb1}) {

@@ -39,11 +39,13 @@ void StoreMasked(void* target, uint64_t mask, const Vector& vector) {
 
 } // namespace avx512_emulation
 
+#undef _mm512_stream_si512
 #undef _mm512_maskz_loadu_epi8
 #undef _mm256_maskz_loadu_epi8
 #undef _mm512_mask_storeu_epi8
 #undef _mm256_mask_storeu_epi8
 #undef _mm_mask_storeu_epi8
+#define _mm512_stream_si512(target, value) simde_mm512_store_si512(target, value)
 #define _mm512_maskz_loadu_epi8(mask, source) avx512_emulation::LoadMasked<simde__m512i>(mask, source)
 #define _mm256_maskz_loadu_epi8(mask, source) avx512_emulation::LoadMasked<simde__m256i>(mask, source)
 #define _mm512_mask_storeu_epi8(target, mask, vector) avx512_emulation::StoreMasked(target, mask, vector)

@@ -14,11 +14,12 @@ struct KernelCase {
     std::vector<Extent> targets;
     std::vector<Extent> sources;
     size_t widthStep; ///< 2: even widths only
-    void (*run)(const image::RowKernels& kernels, uint8_t* const* targets, const uint8_t* const* sources,
-                ptrdiff_t width);
+    void (*run)(const image::RowKernels& kernels, uint8_t* const* targets, uint8_t* const* sources,
+                image::Size size);
 };
 
-/// Where a kernel has two rows of a kind, they are the entries 0 and 1, of alpha 4 and 5.
+/// Pictures of one or two rows, each in memory of its own: the entries 0 and 1 are rows of packed pixels or
+/// luma, 2 and 3 those of chroma, 4 and 5 those of alpha.
 const std::vector<KernelCase>& KernelCases();
 
 #endif

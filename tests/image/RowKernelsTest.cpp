@@ -34,16 +34,15 @@ protected:
         }
     }
 
-    /// Runs the level's kernel and the plain one on the same rows. With `oneRow` the rows of a pair are the
-    /// same row.
-    void Compare(const RowKernels& level, const KernelCase& kernel, size_t width, Placement placement,
-                 Content content, bool oneRow) {
-        const auto isSecond = [](size_t i) { return i == 1 || i == 5; };
-        const uint8_t* source[kMaxRows]{};
+    /// Runs the level's kernel and the plain one on the same rows.
+    void Compare(const RowKernels& level, const KernelCase& kernel, Size size, Placement placement,
+                 Content content) {
+        const auto width = static_cast<size_t>(size.width);
+        uint8_t* source[kMaxRows]{};
         for (size_t i = 0; i < kernel.sources.size(); ++i) {
             const auto block = sources[i]->Block(kernel.sources[i](width), placement);
             Fill(block, content);
-            source[i] = oneRow && i == 1 ? source[0] : block.data();
+            source[i] = block.data();
         }
         uint8_t* target[kMaxRows]{};
         uint8_t* plainTarget[kMaxRows]{};
@@ -51,21 +50,20 @@ protected:
         for (size_t i = 0; i < kernel.targets.size(); ++i) {
             const auto block = targets[i]->Block(kernel.targets[i](width), placement);
             Fill(block, content);
+            target[i] = block.data();
             plain[i].assign(block.begin(), block.end());
-            const bool shared = oneRow && isSecond(i);
-            target[i] = shared ? target[i - 1] : block.data();
-            plainTarget[i] = shared ? plainTarget[i - 1] : plain[i].data();
+            plainTarget[i] = plain[i].data();
         }
 
-        kernel.run(level, target, source, static_cast<ptrdiff_t>(width));
-        kernel.run(*RowKernelsFor(KernelLevel::kPlain), plainTarget, source, static_cast<ptrdiff_t>(width));
+        kernel.run(level, target, source, size);
+        kernel.run(*RowKernelsFor(KernelLevel::kPlain), plainTarget, source, size);
 
         for (size_t i = 0; i < kernel.targets.size(); ++i) {
             ASSERT_TRUE(targets[i]->GuardsIntact()) << "wrote outside target row " << i;
-            const size_t bytes = plain[i].size();
             const auto firstWrong =
-                std::mismatch(plainTarget[i], plainTarget[i] + bytes, target[i]).second - target[i];
-            ASSERT_EQ(static_cast<size_t>(firstWrong), bytes) << "first wrong byte of target row " << i;
+                std::mismatch(plain[i].begin(), plain[i].end(), target[i]).first - plain[i].begin();
+            ASSERT_EQ(static_cast<size_t>(firstWrong), plain[i].size())
+                << "first wrong byte of target row " << i;
         }
     }
 
@@ -75,16 +73,17 @@ protected:
                 continue;
             for (const Placement placement : kPlacements) {
                 for (const Content content : {Content::kRandom, Content::kExtremes}) {
-                    for (const bool oneRow : {false, true}) {
-                        Compare(*kernels, kernel, width, placement, content, oneRow);
+                    for (const ptrdiff_t height : {1, 2}) {
+                        const Size size{static_cast<ptrdiff_t>(width), height};
+                        Compare(*kernels, kernel, size, placement, content);
                         const bool suitsLarge =
                             width % kLargeWidthStep == 0 && placement != Placement::kMisaligned && width > 0;
                         if (kernels->large != nullptr && suitsLarge && !HasFatalFailure())
-                            Compare(*kernels->large, kernel, width, placement, content, oneRow);
+                            Compare(*kernels->large, kernel, size, placement, content);
                         if (HasFatalFailure()) {
                             FAIL() << kernel.name << ", width " << width << ", placement "
                                    << static_cast<int>(placement) << ", content " << static_cast<int>(content)
-                                   << (oneRow ? ", one row" : "");
+                                   << ", rows " << height;
                         }
                     }
                 }

@@ -9,8 +9,8 @@
 // Every kernel is flattened: one loop without a call, its constants in registers.
 //
 // Widths: whole blocks, then the last whole block of an even width once more over what has been written,
-// which gives the same bytes. Rows shorter than a block go to the next lower level, an odd last column to the
-// plain kernels.
+// which gives the same bytes. Pictures narrower than a block go to the next lower level, an odd last column
+// to the plain kernels, while its row is near.
 #ifndef MOVIECONV_COMMON_IMAGE_KERNELS_LANEKERNELS_H
 #define MOVIECONV_COMMON_IMAGE_KERNELS_LANEKERNELS_H
 
@@ -33,26 +33,28 @@ class LaneKernels {
     // --- Widths
     // ------------------------------------------------------------------------------------------------------
 
-    /// Calls block(x) so that all columns of an even width are covered; returns how many are: all, or none of
-    /// a row that is too short. One place calls the block, so that the compiler keeps its constants in
-    /// registers.
-    template <class Block>
-    static ptrdiff_t ForBlocks(ptrdiff_t width, ptrdiff_t blockPixels, Block block) {
+    /// Calls block(x) so that all columns of an even width are covered, and last(done) for an odd column
+    /// behind them. The width is not less than a block. One place calls the block, so that the compiler keeps
+    /// its constants in registers.
+    template <class Block, class Last>
+    static void ForBlocks(ptrdiff_t width, ptrdiff_t blockPixels, Block block, Last last) {
         const ptrdiff_t even = width & ~ptrdiff_t{1};
-        const ptrdiff_t last = even - blockPixels;
-        if (last < 0)
-            return 0;
-        for (ptrdiff_t x = 0;; x = x + blockPixels < last ? x + blockPixels : last) {
+        const ptrdiff_t lastBlock = even - blockPixels;
+        for (ptrdiff_t x = 0; x < lastBlock; x += blockPixels)
             block(x);
-            if (x == last)
-                break;
-        }
-        V::FinishRow();
-        return even;
+        block(lastBlock);
+        if (even < width)
+            last(even);
     }
 
-    /// What converts the columns from `done` on.
-    static const RowKernels& Rest(ptrdiff_t done) { return done == 0 ? V::Lower() : kPlainKernels; }
+    /// Of an even width.
+    template <class Block>
+    static void ForBlocks(ptrdiff_t width, Block block) {
+        ForBlocks(width, kPixels, block, [](ptrdiff_t) {});
+    }
+
+    /// The size of what is left of a pair of rows.
+    static Size LastColumn(ptrdiff_t row0, ptrdiff_t row1) { return {1, row1 - row0 + 1}; }
 
     template <class Byte>
     static RowPair<Byte> Advance(RowPair<Byte> rows, ptrdiff_t bytes) {
@@ -227,30 +229,53 @@ class LaneKernels {
         StoreAlternating(u, v, StoredChroma<2>(AddRows(first, second)));
     }
 
-    template <class Format, class Form, To420 RowKernels::*kRest>
-    [[gnu::flatten]] static void RgbTo420(RowPair<uint8_t> y, uint8_t* u, uint8_t* v,
-                                          RowPair<const uint8_t> rgb, ptrdiff_t width) {
-        const ptrdiff_t done = ForBlocks(width, kPixels, [&](ptrdiff_t x) {
-            RgbBlockTo420<Format, Form>(Advance(y, x), u + x / 2, v + x / 2, Advance(rgb, Format::kBytes * x),
-                                        [](RowIndex, const Quads&) {});
+    template <class Format, class Form, To420 RowKernels::*kKernel>
+    [[gnu::flatten]] static void RgbTo420(Planes420 target, Rows rgb, Size size) {
+        if (size.width < kPixels)
+            return (V::Lower().*kKernel)(target, rgb, size);
+        ForRowPairs(size.height, [&](ptrdiff_t row0, ptrdiff_t row1, ptrdiff_t half) {
+            const auto y = target.y.Targets(row0, row1);
+            const auto source = rgb.Sources(row0, row1);
+            uint8_t* const u = target.u[half];
+            uint8_t* const v = target.v[half];
+            ForBlocks(
+                size.width, kPixels,
+                [&](ptrdiff_t x) {
+                    RgbBlockTo420<Format, Form>(Advance(y, x), u + x / 2, v + x / 2,
+                                                Advance(source, Format::kBytes * x),
+                                                [](RowIndex, const Quads&) {});
+                },
+                [&](ptrdiff_t x) {
+                    (kPlainKernels.*kKernel)(target.At(x, row0), rgb.At(row0, Format::kBytes * x),
+                                             LastColumn(row0, row1));
+                });
         });
-        if (done < width)
-            (Rest(done).*kRest)(Advance(y, done), u + done / 2, v + done / 2,
-                                Advance(rgb, Format::kBytes * done), width - done);
+        V::FinishPicture();
     }
 
-    [[gnu::flatten]] static void RgbaTo420(RowPair<uint8_t> y, uint8_t* u, uint8_t* v, RowPair<uint8_t> alpha,
-                                           RowPair<const uint8_t> rgba, ptrdiff_t width) {
-        const ptrdiff_t done = ForBlocks(width, kPixels, [&](ptrdiff_t x) {
-            const auto storeAlpha = [&](RowIndex row, const Quads& bytes) {
-                V::Store((row == kFirst ? alpha.first : alpha.second) + x, Bgr32::Alpha(bytes));
-            };
-            RgbBlockTo420<Bgr32, FastRgbForm>(Advance(y, x), u + x / 2, v + x / 2, Advance(rgba, 4 * x),
-                                              storeAlpha);
+    [[gnu::flatten]] static void RgbaTo420(Planes420 target, Rows alpha, Rows bgra, Size size) {
+        if (size.width < kPixels)
+            return V::Lower().bgra32To420(target, alpha, bgra, size);
+        ForRowPairs(size.height, [&](ptrdiff_t row0, ptrdiff_t row1, ptrdiff_t half) {
+            const auto y = target.y.Targets(row0, row1);
+            const auto source = bgra.Sources(row0, row1);
+            uint8_t* const u = target.u[half];
+            uint8_t* const v = target.v[half];
+            ForBlocks(
+                size.width, kPixels,
+                [&](ptrdiff_t x) {
+                    const auto storeAlpha = [&](RowIndex row, const Quads& bytes) {
+                        V::Store(alpha[row == kFirst ? row0 : row1] + x, Bgr32::Alpha(bytes));
+                    };
+                    RgbBlockTo420<Bgr32, FastRgbForm>(Advance(y, x), u + x / 2, v + x / 2,
+                                                      Advance(source, 4 * x), storeAlpha);
+                },
+                [&](ptrdiff_t x) {
+                    kPlainKernels.bgra32To420(target.At(x, row0), alpha.At(row0, x), bgra.At(row0, 4 * x),
+                                              LastColumn(row0, row1));
+                });
         });
-        if (done < width)
-            Rest(done).bgra32To420(Advance(y, done), u + done / 2, v + done / 2, Advance(alpha, done),
-                                   Advance(rgba, 4 * done), width - done);
+        V::FinishPicture();
     }
 
     // --- YUV to RGB
@@ -373,20 +398,30 @@ class LaneKernels {
         }
     };
 
-    template <class Target, class Form, From420 RowKernels::*kRest>
-    [[gnu::flatten]] static void RgbFrom420(RowPair<uint8_t> rgb, RowPair<const uint8_t> y, const uint8_t* u,
-                                            const uint8_t* v, ptrdiff_t width) {
-        const ptrdiff_t done = ForBlocks(width, kPixels, [&](ptrdiff_t x) {
-            const auto convert = [&](uint8_t* target, const uint8_t* luma, const ChromaTerms& terms) {
-                Target::Store(target, MakeComponents<Form>(V::Load(luma), terms));
-            };
-            const ChromaTerms terms = MakeTerms<Form>(V::LoadAlternating(u + x / 2, v + x / 2));
-            convert(rgb.first + Target::kBytes * x, y.first + x, terms);
-            convert(rgb.second + Target::kBytes * x, y.second + x, terms);
+    template <class Target, class Form, From420 RowKernels::*kKernel>
+    [[gnu::flatten]] static void RgbFrom420(Rows rgb, Planes420 source, Size size) {
+        if (size.width < kPixels)
+            return (V::Lower().*kKernel)(rgb, source, size);
+        ForRowPairs(size.height, [&](ptrdiff_t row0, ptrdiff_t row1, ptrdiff_t half) {
+            const auto target = rgb.Targets(row0, row1);
+            const auto y = source.y.Sources(row0, row1);
+            const uint8_t* const u = source.u[half];
+            const uint8_t* const v = source.v[half];
+            ForBlocks(
+                size.width, kPixels,
+                [&](ptrdiff_t x) {
+                    const ChromaTerms terms = MakeTerms<Form>(V::LoadAlternating(u + x / 2, v + x / 2));
+                    Target::Store(target.first + Target::kBytes * x,
+                                  MakeComponents<Form>(V::Load(y.first + x), terms));
+                    Target::Store(target.second + Target::kBytes * x,
+                                  MakeComponents<Form>(V::Load(y.second + x), terms));
+                },
+                [&](ptrdiff_t x) {
+                    (kPlainKernels.*kKernel)(rgb.At(row0, Target::kBytes * x), source.At(x, row0),
+                                             LastColumn(row0, row1));
+                });
         });
-        if (done < width)
-            (Rest(done).*kRest)(Advance(rgb, Target::kBytes * done), Advance(y, done), u + done / 2,
-                                v + done / 2, width - done);
+        V::FinishPicture();
     }
 
     // --- Packed 4:2:2
@@ -423,119 +458,199 @@ class LaneKernels {
     }
 
     template <PackedOrder kOrder>
-    [[gnu::flatten]] static void PackedTo420(RowPair<uint8_t> y, uint8_t* u, uint8_t* v,
-                                             RowPair<const uint8_t> packed, ptrdiff_t width) {
-        const ptrdiff_t done = ForBlocks(width, kPixels, [&](ptrdiff_t x) {
-            constexpr LaneBytes kApart{0, 4, 8, 12, 1, 5, 9, 13, 2, 6, 10, 14, 3, 7, 11, 15};
-            const auto load = [=](const uint8_t* row, int half) {
-                return V::LoadLanes(row + 2 * x + 16 * half, 32);
-            };
-            const Vec first[2] = {load(packed.first, 0), load(packed.first, 1)};
-            const Vec second[2] = {load(packed.second, 0), load(packed.second, 1)};
-            const auto luma = [](const Vec(&halves)[2]) {
-                return V::PackUs16(LumaWords<kOrder>(halves[0]), LumaWords<kOrder>(halves[1]));
-            };
-            // In the upper bytes: without anything below them the average's rounding has no effect there.
-            const auto average = [](Vec a, Vec b) {
-                return V::Average16(ChromaAbove<kOrder>(a), ChromaAbove<kOrder>(b));
-            };
-            const Vec chroma = V::Blend8(HighBytes(average(first[0], second[0])),
-                                         average(first[1], second[1]), V::Set16(-0x100));
-            V::Store(y.first + x, luma(first));
-            V::Store(y.second + x, luma(second));
-            V::StoreHalves(u + x / 2, v + x / 2, V::ExchangeMiddle(V::Shuffle8(chroma, V::Lane(kApart))));
-        });
-        if (done < width)
-            Rest(done).packedTo420[kOrder](Advance(y, done), u + done / 2, v + done / 2,
-                                           Advance(packed, 2 * done), width - done);
+    static void PackedBlockTo420(RowPair<uint8_t> y, uint8_t* u, uint8_t* v, RowPair<const uint8_t> packed) {
+        constexpr LaneBytes kApart{0, 4, 8, 12, 1, 5, 9, 13, 2, 6, 10, 14, 3, 7, 11, 15};
+        const auto load = [](const uint8_t* row, int half) { return V::LoadLanes(row + 16 * half, 32); };
+        const Vec first[2] = {load(packed.first, 0), load(packed.first, 1)};
+        const Vec second[2] = {load(packed.second, 0), load(packed.second, 1)};
+        const auto luma = [](const Vec(&halves)[2]) {
+            return V::PackUs16(LumaWords<kOrder>(halves[0]), LumaWords<kOrder>(halves[1]));
+        };
+        // In the upper bytes: without anything below them the average's rounding has no effect there.
+        const auto average = [](Vec a, Vec b) {
+            return V::Average16(ChromaAbove<kOrder>(a), ChromaAbove<kOrder>(b));
+        };
+        const Vec chroma = V::Blend8(HighBytes(average(first[0], second[0])), average(first[1], second[1]),
+                                     V::Set16(-0x100));
+        V::Store(y.first, luma(first));
+        V::Store(y.second, luma(second));
+        V::StoreHalves(u, v, V::ExchangeMiddle(V::Shuffle8(chroma, V::Lane(kApart))));
     }
 
     template <PackedOrder kOrder>
-    [[gnu::flatten]] static void PackedFrom420(RowPair<uint8_t> packed, RowPair<const uint8_t> y,
-                                               const uint8_t* u, const uint8_t* v, ptrdiff_t width) {
-        const ptrdiff_t done = ForBlocks(width, kPixels, [&](ptrdiff_t x) {
-            const Vec uv = V::LoadAlternating(u + x / 2, v + x / 2);
-            StorePacked<kOrder>(packed.first + 2 * x, V::Load(y.first + x), uv);
-            StorePacked<kOrder>(packed.second + 2 * x, V::Load(y.second + x), uv);
+    [[gnu::flatten]] static void PackedTo420(Planes420 target, Rows packed, Size size) {
+        if (size.width < kPixels)
+            return V::Lower().packedTo420[kOrder](target, packed, size);
+        ForRowPairs(size.height, [&](ptrdiff_t row0, ptrdiff_t row1, ptrdiff_t half) {
+            const auto y = target.y.Targets(row0, row1);
+            const auto source = packed.Sources(row0, row1);
+            uint8_t* const u = target.u[half];
+            uint8_t* const v = target.v[half];
+            ForBlocks(size.width, [&](ptrdiff_t x) {
+                PackedBlockTo420<kOrder>(Advance(y, x), u + x / 2, v + x / 2, Advance(source, 2 * x));
+            });
         });
-        if (done < width)
-            Rest(done).packedFrom420[kOrder](Advance(packed, 2 * done), Advance(y, done), u + done / 2,
-                                             v + done / 2, width - done);
+        V::FinishPicture();
     }
 
     template <PackedOrder kOrder>
-    [[gnu::flatten]] static void PackedFromBgr24(uint8_t* packed, const uint8_t* rgb, ptrdiff_t width) {
-        const ptrdiff_t done = ForBlocks(width, kPixels, [&](ptrdiff_t x) {
-            const Quads pixels = Bgr24::Pixels(Bgr24::Load(rgb + 3 * x));
-            StorePacked<kOrder>(packed + 2 * x, Luma<FastRgbForm>(pixels),
-                                StoredChroma<1>(PixelChroma<FastRgbForm>(pixels)));
+    [[gnu::flatten]] static void PackedFrom420(Rows packed, Planes420 source, Size size) {
+        if (size.width < kPixels)
+            return V::Lower().packedFrom420[kOrder](packed, source, size);
+        ForRowPairs(size.height, [&](ptrdiff_t row0, ptrdiff_t row1, ptrdiff_t half) {
+            const auto target = packed.Targets(row0, row1);
+            const auto y = source.y.Sources(row0, row1);
+            const uint8_t* const u = source.u[half];
+            const uint8_t* const v = source.v[half];
+            ForBlocks(size.width, [&](ptrdiff_t x) {
+                const Vec uv = V::LoadAlternating(u + x / 2, v + x / 2);
+                StorePacked<kOrder>(target.first + 2 * x, V::Load(y.first + x), uv);
+                StorePacked<kOrder>(target.second + 2 * x, V::Load(y.second + x), uv);
+            });
         });
-        if (done < width)
-            Rest(done).packedFromBgr24[kOrder](packed + 2 * done, rgb + 3 * done, width - done);
+        V::FinishPicture();
+    }
+
+    /// Walks single rows of pictures with the given bytes a pixel. `kernel` is this one's in a table.
+    template <ptrdiff_t kTargetBytes, ptrdiff_t kSourceBytes, class Kernel, class Block>
+    static void ForRowBlocks(Rows target, Rows source, Size size, Kernel kernel, Block block) {
+        if (size.width < kPixels)
+            return kernel(V::Lower())(target, source, size);
+        for (ptrdiff_t row = 0; row < size.height; ++row) {
+            uint8_t* const to = target[row];
+            const uint8_t* const from = source[row];
+            ForBlocks(
+                size.width, kPixels,
+                [&](ptrdiff_t x) { block(to + kTargetBytes * x, from + kSourceBytes * x); },
+                [&](ptrdiff_t x) {
+                    kernel(kPlainKernels)(target.At(row, kTargetBytes * x), source.At(row, kSourceBytes * x),
+                                          LastColumn(row, row));
+                });
+        }
+        V::FinishPicture();
     }
 
     template <PackedOrder kOrder>
-    [[gnu::flatten]] static void Bgr24FromPacked(uint8_t* rgb, const uint8_t* packed, ptrdiff_t width) {
-        const ptrdiff_t done = ForBlocks(width, kPixels, [&](ptrdiff_t x) {
-            const Vec halves[2] = {V::LoadLanes(packed + 2 * x, 32), V::LoadLanes(packed + 2 * x + 16, 32)};
-            const Vec y = V::PackUs16(LumaWords<kOrder>(halves[0]), LumaWords<kOrder>(halves[1]));
-            const Vec uv = V::PackUs16(ChromaWords<kOrder>(halves[0]), ChromaWords<kOrder>(halves[1]));
-            Bgr24Target::Store(rgb + 3 * x, MakeComponents<FastYuvForm>(y, MakeTerms<FastYuvForm>(uv)));
-        });
-        if (done < width)
-            Rest(done).bgr24FromPacked[kOrder](rgb + 3 * done, packed + 2 * done, width - done);
+    [[gnu::flatten]] static void PackedFromBgr24(Rows packed, Rows rgb, Size size) {
+        ForRowBlocks<2, 3>(
+            packed, rgb, size, [](const RowKernels& k) { return k.packedFromBgr24[kOrder]; },
+            [](uint8_t* to, const uint8_t* from) {
+                const Quads pixels = Bgr24::Pixels(Bgr24::Load(from));
+                StorePacked<kOrder>(to, Luma<FastRgbForm>(pixels),
+                                    StoredChroma<1>(PixelChroma<FastRgbForm>(pixels)));
+            });
     }
 
-    [[gnu::flatten]] static void SwapPacked(uint8_t* target, const uint8_t* source, ptrdiff_t width) {
-        constexpr LaneBytes kSwapped{1, 0, 3, 2, 5, 4, 7, 6, 9, 8, 11, 10, 13, 12, 15, 14};
-        const ptrdiff_t done = ForBlocks(width, kPixels, [&](ptrdiff_t x) {
-            for (ptrdiff_t i = 2 * x; i < 2 * x + 2 * kPixels; i += kPixels)
-                V::Store(target + i, V::Shuffle8(V::Load(source + i), V::Lane(kSwapped)));
-        });
-        if (done < width)
-            Rest(done).swapPacked(target + 2 * done, source + 2 * done, width - done);
+    template <PackedOrder kOrder>
+    [[gnu::flatten]] static void Bgr24FromPacked(Rows rgb, Rows packed, Size size) {
+        ForRowBlocks<3, 2>(
+            rgb, packed, size, [](const RowKernels& k) { return k.bgr24FromPacked[kOrder]; },
+            [](uint8_t* to, const uint8_t* from) {
+                const Vec halves[2] = {V::LoadLanes(from, 32), V::LoadLanes(from + 16, 32)};
+                const Vec y = V::PackUs16(LumaWords<kOrder>(halves[0]), LumaWords<kOrder>(halves[1]));
+                const Vec uv = V::PackUs16(ChromaWords<kOrder>(halves[0]), ChromaWords<kOrder>(halves[1]));
+                Bgr24Target::Store(to, MakeComponents<FastYuvForm>(y, MakeTerms<FastYuvForm>(uv)));
+            });
+    }
+
+    [[gnu::flatten]] static void SwapPacked(Rows target, Rows source, Size size) {
+        ForRowBlocks<2, 2>(
+            target, source, size, [](const RowKernels& k) { return k.swapPacked; },
+            [](uint8_t* to, const uint8_t* from) {
+                constexpr LaneBytes kSwapped{1, 0, 3, 2, 5, 4, 7, 6, 9, 8, 11, 10, 13, 12, 15, 14};
+                for (ptrdiff_t i = 0; i < 2 * kPixels; i += kPixels)
+                    V::Store(to + i, V::Shuffle8(V::Load(from + i), V::Lane(kSwapped)));
+            });
+    }
+
+    /// Stores to whole vectors of memory, but for both ends of a row: a store across a cache line takes two.
+    [[gnu::flatten]] static void Copy(Rows target, Rows source, Size size) {
+        constexpr ptrdiff_t kBytes = sizeof(Vec);
+        const ptrdiff_t last = size.width - kBytes;
+        if (last < 0)
+            return V::Lower().copy(target, source, size);
+        for (ptrdiff_t row = 0; row < size.height; ++row) {
+            uint8_t* const to = target[row];
+            const uint8_t* const from = source[row];
+            const auto misaligned = static_cast<ptrdiff_t>(reinterpret_cast<uintptr_t>(to) % kBytes);
+            V::Store(to, V::Load(from));
+            for (ptrdiff_t x = kBytes - misaligned; x < last; x += kBytes)
+                V::Store(to + x, V::Load(from + x));
+            V::Store(to + last, V::Load(from + last));
+        }
+        V::FinishPicture();
     }
 
     // --- Planes
     // ------------------------------------------------------------------------------------------------------
 
-    // Blocks of half the size serve rows that are too short for a whole one.
+    // Blocks of half the size serve planes that are too narrow for a whole one.
 
-    [[gnu::flatten]] static void Halve(uint8_t* target, RowPair<const uint8_t> source, ptrdiff_t width) {
-        const auto average = [&](ptrdiff_t x) {
-            const Vec ones = V::Set8(1);
-            return V::template Srl16<2>(V::Add16(V::MulAddU8S8(V::Load(source.first + x), ones),
-                                                 V::MulAddU8S8(V::Load(source.second + x), ones)));
-        };
-        const auto bytes = [](Vec low, Vec high) { return V::ExchangeMiddle(V::PackUs16(low, high)); };
-        const ptrdiff_t done =
-            width >= 2 * kPixels
-                ? ForBlocks(
-                      width, 2 * kPixels,
-                      [&](ptrdiff_t x) { V::Store(target + x / 2, bytes(average(x), average(x + kPixels))); })
-                : ForBlocks(width, kPixels, [&](ptrdiff_t x) {
-                      const Vec averages = average(x);
-                      V::StoreHalf(target + x / 2, bytes(averages, averages));
-                  });
-        if (done < width)
-            Rest(done).halve(target + done / 2, Advance(source, done), width - done);
+    template <class Block>
+    static void HalveBy(ptrdiff_t blockPixels, Rows target, Rows source, Size size, Block block) {
+        ForRowPairs(size.height, [&](ptrdiff_t row0, ptrdiff_t row1, ptrdiff_t half) {
+            const auto from = source.Sources(row0, row1);
+            uint8_t* const to = target[half];
+            ForBlocks(
+                size.width, blockPixels, [&](ptrdiff_t x) { block(to + x / 2, Advance(from, x)); },
+                [&](ptrdiff_t x) {
+                    kPlainKernels.halve(target.At(half, x / 2), source.At(row0, x), LastColumn(row0, row1));
+                });
+        });
+        V::FinishPicture();
     }
 
-    [[gnu::flatten]] static void Doubled(RowPair<uint8_t> target, const uint8_t* source, ptrdiff_t width) {
-        const ptrdiff_t done = width >= kPixels
-                                   ? ForBlocks(width, kPixels,
-                                               [&](ptrdiff_t x) {
-                                                   const Vec samples = V::Load(source + x);
-                                                   StoreInterleaved(target.first + 2 * x, samples, samples);
-                                                   StoreInterleaved(target.second + 2 * x, samples, samples);
-                                               })
-                                   : ForBlocks(width, kPixels / 2, [&](ptrdiff_t x) {
-                                         const Vec twice = V::LoadAlternating(source + x, source + x);
-                                         V::Store(target.first + 2 * x, twice);
-                                         V::Store(target.second + 2 * x, twice);
-                                     });
-        if (done < width)
-            Rest(done).doubled(Advance(target, 2 * done), source + done, width - done);
+    /// Averages of the four samples in each 2 x 2 of a vector's, as words.
+    static Vec BlockAverages(RowPair<const uint8_t> rows) {
+        const Vec ones = V::Set8(1);
+        return V::template Srl16<2>(
+            V::Add16(V::MulAddU8S8(V::Load(rows.first), ones), V::MulAddU8S8(V::Load(rows.second), ones)));
+    }
+
+    [[gnu::flatten]] static void Halve(Rows target, Rows source, Size size) {
+        const auto bytes = [](Vec low, Vec high) { return V::ExchangeMiddle(V::PackUs16(low, high)); };
+        if (size.width < kPixels)
+            V::Lower().halve(target, source, size);
+        else if (size.width < 2 * kPixels)
+            HalveBy(kPixels, target, source, size, [&](uint8_t* to, RowPair<const uint8_t> from) {
+                const Vec averages = BlockAverages(from);
+                V::StoreHalf(to, bytes(averages, averages));
+            });
+        else
+            HalveBy(2 * kPixels, target, source, size, [&](uint8_t* to, RowPair<const uint8_t> from) {
+                V::Store(to, bytes(BlockAverages(from), BlockAverages(Advance(from, kPixels))));
+            });
+    }
+
+    template <class Block>
+    static void DoubleBy(ptrdiff_t blockPixels, Rows target, Rows source, Size size, Block block) {
+        for (ptrdiff_t row = 0; row < size.height; ++row) {
+            const auto to = target.Targets(2 * row, 2 * row + 1);
+            const uint8_t* const from = source[row];
+            ForBlocks(
+                size.width, blockPixels, [&](ptrdiff_t x) { block(Advance(to, 2 * x), from + x); },
+                [&](ptrdiff_t x) {
+                    kPlainKernels.doubled(target.At(2 * row, 2 * x), source.At(row, x), LastColumn(row, row));
+                });
+        }
+        V::FinishPicture();
+    }
+
+    [[gnu::flatten]] static void Doubled(Rows target, Rows source, Size size) {
+        if (size.width < kPixels / 2)
+            V::Lower().doubled(target, source, size);
+        else if (size.width < kPixels)
+            DoubleBy(kPixels / 2, target, source, size, [](RowPair<uint8_t> to, const uint8_t* from) {
+                const Vec twice = V::LoadAlternating(from, from);
+                V::Store(to.first, twice);
+                V::Store(to.second, twice);
+            });
+        else
+            DoubleBy(kPixels, target, source, size, [](RowPair<uint8_t> to, const uint8_t* from) {
+                const Vec samples = V::Load(from);
+                StoreInterleaved(to.first, samples, samples);
+                StoreInterleaved(to.second, samples, samples);
+            });
     }
 
 public:
@@ -554,6 +669,7 @@ public:
             .packedFromBgr24 = {PackedFromBgr24<kUyvy>, PackedFromBgr24<kYuy2>},
             .bgr24FromPacked = {Bgr24FromPacked<kUyvy>, Bgr24FromPacked<kYuy2>},
             .swapPacked = SwapPacked,
+            .copy = Copy,
             .halve = Halve,
             .doubled = Doubled,
             .large = large,

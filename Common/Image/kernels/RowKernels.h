@@ -1,40 +1,31 @@
-// The row kernels: everything that touches pixels. A kernel converts one row, or the two rows that share
-// chroma, of any width; no kernel reads or writes outside the samples that its width covers.
+// The row kernels: everything that touches pixels. A kernel converts the rows of a picture of any size; no
+// kernel reads or writes outside the samples that the size covers.
 //
 // Every instruction set fills one RowKernels table with kernels that give the same bytes as the plain ones. A
-// kernel needs no alignment and allows no overlap of source and destination, but the two rows of a pair may
-// be the same row.
+// kernel needs no alignment and allows no overlap of source and destination.
 #ifndef MOVIECONV_COMMON_IMAGE_KERNELS_ROWKERNELS_H
 #define MOVIECONV_COMMON_IMAGE_KERNELS_ROWKERNELS_H
+
+#include "Common/Image/PictureViews.h"
 
 #include <cstddef>
 #include <cstdint>
 
 namespace image {
 
-template <class Byte>
-struct RowPair {
-    Byte* first;
-    Byte* second;
-};
-
 /// Byte orders of packed 4:2:2, as an index into the table.
 enum PackedOrder { kUyvy = 0, kYuy2 = 1, kPackedOrders = 2 };
 
-/// What makes 4:2:0 from two packed rows. Y has `width` samples a row, U and V half as many, rounded up.
-using To420 = void (*)(RowPair<uint8_t> y, uint8_t* u, uint8_t* v, RowPair<const uint8_t> packed,
-                       ptrdiff_t width);
-using To420Alpha = void (*)(RowPair<uint8_t> y, uint8_t* u, uint8_t* v, RowPair<uint8_t> alpha,
-                            RowPair<const uint8_t> packed, ptrdiff_t width);
-/// What makes two packed rows from 4:2:0.
-using From420 = void (*)(RowPair<uint8_t> packed, RowPair<const uint8_t> y, const uint8_t* u,
-                         const uint8_t* v, ptrdiff_t width);
-using RowToRow = void (*)(uint8_t* target, const uint8_t* source, ptrdiff_t width);
-using HalveRows = void (*)(uint8_t* target, RowPair<const uint8_t> source, ptrdiff_t width);
-using DoubleRow = void (*)(RowPair<uint8_t> target, const uint8_t* source, ptrdiff_t width);
+/// What makes 4:2:0 from a packed picture. U and V have half as many columns and rows, rounded up.
+using To420 = void (*)(Planes420 target, Rows packed, Size size);
+using To420Alpha = void (*)(Planes420 target, Rows alpha, Rows packed, Size size);
+/// What makes a packed picture from 4:2:0.
+using From420 = void (*)(Rows packed, Planes420 source, Size size);
+/// What makes a packed picture or a plane from another.
+using RowsToRows = void (*)(Rows target, Rows source, Size size);
 
 struct RowKernels {
-    // RGB to 4:2:0. The missing pixel beyond an odd width is the last one again.
+    // RGB to 4:2:0. The pixels missing beyond an odd width or height are the last ones again.
     To420 bgr32To420;
     To420 bgr24To420;
     To420 bgr24To420Simple;
@@ -50,22 +41,26 @@ struct RowKernels {
     To420 packedTo420[kPackedOrders];
     From420 packedFrom420[kPackedOrders];
 
-    // 4:2:2 from and to RGB, one row. Beyond an odd width a written group repeats its pixel, and a read one
-    // has no second pixel.
-    RowToRow packedFromBgr24[kPackedOrders];
-    RowToRow bgr24FromPacked[kPackedOrders];
+    // 4:2:2 from and to RGB. Beyond an odd width a written group repeats its pixel, and a read one has no
+    // second pixel.
+    RowsToRows packedFromBgr24[kPackedOrders];
+    RowsToRows bgr24FromPacked[kPackedOrders];
 
     // One byte order of 4:2:2 to the other; the width is even.
-    RowToRow swapPacked;
+    RowsToRows swapPacked;
 
-    // Planes: `width` is the source's. Halving averages 2 x 2 samples, truncating; the sample beyond an odd
-    // width is the last one again. Doubling writes every sample to two columns of two rows.
-    HalveRows halve;
-    DoubleRow doubled;
+    // Rows as they are, so many bytes each. For rows of less than a kilobyte, which memcpy takes longer for.
+    RowsToRows copy;
 
-    /// The same kernels for outputs that no cache holds: they write past the caches. That pays where one or
-    /// two rows are written, not where those of three or four planes are. The width is a multiple of
-    /// kLargeWidthStep and every target row begins at a multiple of kLargeAlignment. Null: none.
+    // Planes: the size is the source's. Halving averages 2 x 2 samples, truncating; the samples beyond an odd
+    // width or height are the last ones again. Doubling writes every sample to two columns of two rows.
+    RowsToRows halve;
+    RowsToRows doubled;
+
+    /// The same kernels for packed targets that no cache holds: they write past the caches. That pays where
+    /// much is read too and one or two rows are written at a time, not where those of planes are. The width
+    /// is a multiple of kLargeWidthStep and every target row begins at a multiple of kLargeAlignment. Null:
+    /// none.
     const RowKernels* large = nullptr;
 };
 

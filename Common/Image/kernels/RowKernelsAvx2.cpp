@@ -118,7 +118,7 @@ struct Avx2 {
         Store(p + 64, HighLanes(parts[0], parts[1]));
         Store(p + 96, HighLanes(parts[2], parts[3]));
     }
-    static void FinishRow() {}
+    static void FinishPicture() {}
 };
 
 /// Targets that no cache holds: written past the caches. Sixteen bytes a store, because that is as far as
@@ -142,7 +142,7 @@ struct Avx2Large : Avx2 {
             StoreLane(p + 16 * (kParts + i), HighLane(parts[i]));
     }
 
-    static void FinishRow() { _mm_sfence(); }
+    static void FinishPicture() { _mm_sfence(); }
 };
 
 constexpr RowKernels kLargeKernels = LaneKernels<Avx2Large>::Table();

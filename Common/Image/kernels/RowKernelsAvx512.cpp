@@ -2,7 +2,7 @@
 //
 // A row is a number of whole steps and one part of a step, which is the same code with its loads and stores
 // masked by the byte: masked-off bytes are neither read nor written, and do not fault. Bytes are put in their
-// places by permutations over one or two whole registers.
+// places by permutations over whole registers.
 #include "Common/Image/kernels/FixedPoint.h"
 #include "Common/Image/kernels/RowKernels.h"
 
@@ -26,6 +26,20 @@ struct Part {
     ptrdiff_t count;
 };
 
+/// The rows of a 4:2:0 picture that share chroma, or of its target or source.
+template <class Byte>
+struct PlanesPair {
+    RowPair<Byte> y;
+    Byte* u;
+    Byte* v;
+};
+
+/// Whether pictures of this width are cheaper in smaller registers: at most half a step fills.
+template <int kColumns>
+bool IsNarrow(Size size) {
+    return size.width <= kColumns / 2;
+}
+
 template <int kColumns, class Step>
 void ForSteps(ptrdiff_t width, Step step) {
     ptrdiff_t x = 0;
@@ -40,6 +54,9 @@ uint64_t Bits(ptrdiff_t count) {
         return ~uint64_t{0};
     return count <= 0 ? 0 : (uint64_t{1} << count) - 1;
 }
+
+/// Columns of most steps, each a byte of a register.
+constexpr int kStep = 64;
 
 /// The bytes at `source`, as far as there are any; zeroes behind them.
 template <class Columns>
@@ -58,12 +75,35 @@ __m256i LoadHalf(Columns, const uint8_t* source, ptrdiff_t bytes) {
         return _mm256_loadu_si256(reinterpret_cast<const __m256i*>(source));
 }
 
-template <class Columns>
+/// Where whole registers of packed rows and single planes go.
+struct Cached {
+    static void Store(uint8_t* target, __m512i value) { _mm512_storeu_si512(target, value); }
+    static void Finish() {}
+};
+
+/// Past the caches, for targets that none of them holds: whole cache lines where the target begins with one,
+/// else their quarters, because allocated memory is aligned to 16 bytes.
+struct Streamed {
+    static void Store(uint8_t* target, __m512i value) {
+        if (reinterpret_cast<uintptr_t>(target) % sizeof value == 0) {
+            _mm512_stream_si512(reinterpret_cast<__m512i*>(target), value);
+            return;
+        }
+        auto* const quarters = reinterpret_cast<__m128i*>(target);
+        _mm_stream_si128(quarters, _mm512_castsi512_si128(value));
+        _mm_stream_si128(quarters + 1, _mm512_extracti32x4_epi32(value, 1));
+        _mm_stream_si128(quarters + 2, _mm512_extracti32x4_epi32(value, 2));
+        _mm_stream_si128(quarters + 3, _mm512_extracti32x4_epi32(value, 3));
+    }
+    static void Finish() { _mm_sfence(); }
+};
+
+template <class Memory, class Columns>
 void Store(Columns, uint8_t* target, ptrdiff_t bytes, __m512i value) {
     if constexpr (Columns::kMasked)
         _mm512_mask_storeu_epi8(target, Bits(bytes), value);
     else
-        _mm512_storeu_si512(target, value);
+        Memory::Store(target, value);
 }
 
 template <class Columns>
@@ -93,7 +133,21 @@ struct alignas(64) Table {
     std::array<uint8_t, 64> bytes;
 
     __m512i Load() const { return _mm512_load_si512(bytes.data()); }
+
+    /// The bytes whose place is in the second register of a pair.
+    constexpr uint64_t FromSecond() const {
+        uint64_t mask = 0;
+        for (size_t i = 0; i < bytes.size(); ++i)
+            mask |= uint64_t{bytes[i] / 64U} << i;
+        return mask;
+    }
 };
+
+/// The bytes of two registers at the given places, by a permutation of each: the one of two registers at once
+/// takes three operations on some processors.
+__m512i PermutePair(__m512i first, __m512i second, __m512i places, uint64_t fromSecond) {
+    return _mm512_mask_permutexvar_epi8(_mm512_permutexvar_epi8(places, first), fromSecond, places, second);
+}
 
 /// Byte i of the table is what `entry(i)` says.
 template <class Entry>
@@ -113,7 +167,6 @@ __m512i BytePairs(int low, int high) {
 }
 
 constexpr uint64_t kOddBytes = 0xAAAAAAAAAAAAAAAA;
-constexpr uint32_t kOddWords = 0xAAAAAAAA;
 
 /// Where the samples of pixel p stand in a packed row.
 template <PackedOrder kOrder>
@@ -150,9 +203,7 @@ private:
         if constexpr (Form::kCrSum == 0) {
             return chromaStart_;
         } else {
-            // 4 R, and of G what is less than the step of a sum
-            static_assert(Form::kCrSum == 4 && Form::kScale == 4);
-            return _mm512_add_epi32(chromaStart_, _mm512_srli_epi32(pixels, 22));
+            return _mm512_dpbusd_epi32(chromaStart_, pixels, _mm512_set1_epi32(Form::kCrSum << 8));
         }
     }
 
@@ -221,7 +272,7 @@ template <int kByte>
 class GatherByte {
 public:
     __m256i operator()(__m512i first, __m512i second) const {
-        return _mm512_castsi512_si256(_mm512_permutex2var_epi8(first, places_, second));
+        return _mm512_castsi512_si256(PermutePair(first, second, places_, kPlaces.FromSecond()));
     }
 
 private:
@@ -250,11 +301,14 @@ public:
     explicit GatherPairs(Columns columns) : places_(RepeatLastPixel(columns, kPlaces.Load(), 0x04000400)) {}
 
     __m512i operator()(__m512i low0, __m512i low1, __m512i high0, __m512i high1) const {
-        return _mm512_mask_blend_epi16(kOddWords, _mm512_permutex2var_epi8(low0, places_, low1),
-                                       _mm512_permutex2var_epi8(high0, places_, high1));
+        constexpr uint64_t kFromSecond = kPlaces.FromSecond();
+        const __m512i low = PermutePair(low0, low1, places_, kFromSecond);
+        const __m512i first = _mm512_mask_permutexvar_epi8(low, kHighWords & ~kFromSecond, places_, high0);
+        return _mm512_mask_permutexvar_epi8(first, kHighWords & kFromSecond, places_, high1);
     }
 
 private:
+    static constexpr uint64_t kHighWords = 0xCCCCCCCCCCCCCCCC;
     static constexpr Table kPlaces = MakeTable([](int i) { return 4 * (i / 4 * 2 + i % 2) + 2; });
     __m512i places_;
 };
@@ -266,24 +320,24 @@ template <class Form, class Read>
 class To420Step {
 public:
     template <class Columns>
-    void operator()(Columns columns, RowPair<uint8_t> y, uint8_t* u, uint8_t* v, RowPair<const uint8_t> rgb,
+    void operator()(Columns columns, const PlanesPair<uint8_t>& target, RowPair<const uint8_t> rgb,
                     ptrdiff_t x) const {
         const PixelRun upper = read_(columns, rgb.first, x);
         const Components a = convert_(upper.first);
         const Components b = convert_(upper.second);
-        StoreHalf(columns, y.first + x, columns.count, gatherY_(a.y, b.y));
+        StoreHalf(columns, target.y.first + x, columns.count, gatherY_(a.y, b.y));
         const PixelRun lower = read_(columns, rgb.second, x);
         const Components c = convert_(lower.first);
         const Components d = convert_(lower.second);
-        StoreHalf(columns, y.second + x, columns.count, gatherY_(c.y, d.y));
+        StoreHalf(columns, target.y.second + x, columns.count, gatherY_(c.y, d.y));
 
         const GatherPairs gather(columns);
         const __m512i cb = SumOfFour(gather(a.cb, b.cb, c.cb, d.cb));
         const __m512i cr = SumOfFour(gather(a.cr, b.cr, c.cr, d.cr));
-        const __m512i chroma = _mm512_permutex2var_epi8(cb, gatherChroma_, cr);
+        const __m512i chroma = PermutePair(cb, cr, gatherChroma_, kChroma.FromSecond());
         const ptrdiff_t samples = (columns.count + 1) / 2;
-        StoreQuarter(columns, u + x / 2, samples, _mm512_castsi512_si128(chroma));
-        StoreQuarter(columns, v + x / 2, samples, _mm512_extracti32x4_epi32(chroma, 1));
+        StoreQuarter(columns, target.u + x / 2, samples, _mm512_castsi512_si128(chroma));
+        StoreQuarter(columns, target.v + x / 2, samples, _mm512_extracti32x4_epi32(chroma, 1));
     }
 
 private:
@@ -299,10 +353,23 @@ private:
     __m512i gatherChroma_ = kChroma.Load();
 };
 
-template <class Form, class Read>
-void RgbTo420(RowPair<uint8_t> y, uint8_t* u, uint8_t* v, RowPair<const uint8_t> rgb, ptrdiff_t width) {
+/// Calls visit(target, source, row0, row1) for the pairs of rows of a packed source.
+template <class Visit>
+void ForTargetPairs(const Planes420& target, Rows source, ptrdiff_t height, Visit visit) {
+    ForRowPairs(height, [&](ptrdiff_t row0, ptrdiff_t row1, ptrdiff_t half) {
+        visit(PlanesPair<uint8_t>{target.y.Targets(row0, row1), target.u[half], target.v[half]},
+              source.Sources(row0, row1), row0, row1);
+    });
+}
+
+template <class Form, class Read, To420 RowKernels::*kKernel>
+void RgbTo420(Planes420 target, Rows rgb, Size size) {
+    if (IsNarrow<kRgbStep>(size))
+        return (kAvx2Kernels.*kKernel)(target, rgb, size);
     const To420Step<Form, Read> convert;
-    ForSteps<kRgbStep>(width, [&](ptrdiff_t x, auto columns) { convert(columns, y, u, v, rgb, x); });
+    ForTargetPairs(target, rgb, size.height, [&](const auto& to, auto from, ptrdiff_t, ptrdiff_t) {
+        ForSteps<kRgbStep>(size.width, [&](ptrdiff_t x, auto columns) { convert(columns, to, from, x); });
+    });
 }
 
 template <class Columns>
@@ -314,44 +381,54 @@ void StoreAlpha(Columns columns, uint8_t* alpha, const uint8_t* bgra, ptrdiff_t 
         gather(Load(columns, source, 4 * columns.count), Load(columns, source + 64, 4 * columns.count - 64)));
 }
 
-void Bgra32To420(RowPair<uint8_t> y, uint8_t* u, uint8_t* v, RowPair<uint8_t> alpha,
-                 RowPair<const uint8_t> bgra, ptrdiff_t width) {
+void Bgra32To420(Planes420 target, Rows alpha, Rows bgra, Size size) {
+    if (IsNarrow<kRgbStep>(size))
+        return kAvx2Kernels.bgra32To420(target, alpha, bgra, size);
     const To420Step<FastRgbForm, Bgr32> convert;
     const GatherByte<3> gather;
-    ForSteps<kRgbStep>(width, [&](ptrdiff_t x, auto columns) {
-        convert(columns, y, u, v, bgra, x);
-        StoreAlpha(columns, alpha.first, bgra.first, x, gather);
-        StoreAlpha(columns, alpha.second, bgra.second, x, gather);
+    ForTargetPairs(target, bgra, size.height, [&](const auto& to, auto from, ptrdiff_t row0, ptrdiff_t row1) {
+        uint8_t* const alpha0 = alpha[row0];
+        uint8_t* const alpha1 = alpha[row1];
+        ForSteps<kRgbStep>(size.width, [&](ptrdiff_t x, auto columns) {
+            convert(columns, to, from, x);
+            StoreAlpha(columns, alpha0, from.first, x, gather);
+            StoreAlpha(columns, alpha1, from.second, x, gather);
+        });
     });
 }
 
 // Packed 4:2:2 from RGB -----------------------------------------------------------------------------------
 
-template <PackedOrder kOrder>
-void PackedFromBgr24(uint8_t* packed, const uint8_t* rgb, ptrdiff_t width) {
+template <class Memory, PackedOrder kOrder>
+void PackedFromBgr24(Rows packed, Rows rgb, Size size) {
+    if (IsNarrow<kRgbStep>(size))
+        return kAvx2Kernels.packedFromBgr24[kOrder](packed, rgb, size);
     static constexpr Table kLuma = MakeTable([](int i) { return 4 * (i / 2) + 2; });
     constexpr uint64_t kChromaBytes = kOrder == kYuy2 ? kOddBytes : ~kOddBytes;
     const Bgr24 read;
     const RgbToYuv<FastRgbForm> convert;
-    ForSteps<kRgbStep>(width, [&](ptrdiff_t x, auto columns) {
-        const PixelRun run = read(columns, rgb, x);
-        const Components a = convert(run.first);
-        const Components b = convert(run.second);
-        const __m512i lumaPlaces = RepeatLastPixel(columns, kLuma.Load(), 0x04040000);
-        const __m512i luma = _mm512_permutex2var_epi8(a.y, lumaPlaces, b.y);
-        const GatherPairs gather(columns);
-        const __m512i sums = _mm512_maddubs_epi16(gather(a.cb, b.cb, a.cr, b.cr), _mm512_set1_epi8(1));
-        const __m512i chroma = kOrder == kYuy2 ? _mm512_slli_epi16(sums, 7) : _mm512_srli_epi16(sums, 1);
-        Store(columns, packed + 2 * x, 4 * ((columns.count + 1) / 2),
-              _mm512_mask_blend_epi8(kChromaBytes, luma, chroma));
-    });
+    for (ptrdiff_t row = 0; row < size.height; ++row) {
+        uint8_t* const target = packed[row];
+        const uint8_t* const source = rgb[row];
+        ForSteps<kRgbStep>(size.width, [&](ptrdiff_t x, auto columns) {
+            const PixelRun run = read(columns, source, x);
+            const Components a = convert(run.first);
+            const Components b = convert(run.second);
+            const __m512i lumaPlaces = RepeatLastPixel(columns, kLuma.Load(), 0x04040000);
+            const __m512i luma = PermutePair(a.y, b.y, lumaPlaces, kLuma.FromSecond());
+            const GatherPairs gather(columns);
+            const __m512i sums = _mm512_maddubs_epi16(gather(a.cb, b.cb, a.cr, b.cr), _mm512_set1_epi8(1));
+            const __m512i chroma = kOrder == kYuy2 ? _mm512_slli_epi16(sums, 7) : _mm512_srli_epi16(sums, 1);
+            Store<Memory>(columns, target + 2 * x, 4 * ((columns.count + 1) / 2),
+                          _mm512_mask_blend_epi8(kChromaBytes, luma, chroma));
+        });
+    }
+    Memory::Finish();
 }
 
 // YUV to RGB ------------------------------------------------------------------------------------------------
 // 64 pixels as bytes. They stand in an order in which unpacking within lanes of 128 bits gives 32-bit pixels
 // in memory order: byte 4 k + j of lane L is pixel 16 k + 4 L + j.
-
-constexpr int kRgbFromStep = 64;
 
 constexpr int PixelAt(int place) {
     return place % 16 / 4 * 16 + place / 16 * 4 + place % 4;
@@ -431,42 +508,47 @@ Rgb ToRgb(__m512i y, const ChromaTerms<Form>& terms) {
     return {Component(blueLow, blueHigh), add(terms.green), add(terms.red)};
 }
 
-/// Places of the bytes of one of the three parts of 192 bytes; those of green are in the second register.
-constexpr Table Bgr24Places(int third) {
-    return MakeTable([=](int i) {
-        const int byte = 64 * third + i;
-        return PlaceOf(byte / 3) + (byte % 3 == 1 ? 64 : 0);
-    });
-}
-constexpr uint64_t Bgr24Reds(int third) {
-    uint64_t mask = 0;
-    for (int i = 0; i < 64; ++i)
-        mask |= uint64_t{(64 * third + i) % 3 == 2} << i;
-    return mask;
-}
+/// One of the three parts of 64 pixels of three bytes.
+template <int kThird>
+struct Bgr24Third {
+    static constexpr Table kPlaces = MakeTable([](int i) { return PlaceOf((64 * kThird + i) / 3); });
+    static constexpr uint64_t BytesOf(int component) {
+        uint64_t mask = 0;
+        for (int i = 0; i < 64; ++i)
+            mask |= uint64_t{(64 * kThird + i) % 3 == component} << i;
+        return mask;
+    }
 
+    __m512i operator()(const Rgb& rgb) const {
+        const __m512i blue = _mm512_permutexvar_epi8(places_, rgb.blue);
+        const __m512i blueGreen = _mm512_mask_permutexvar_epi8(blue, BytesOf(1), places_, rgb.green);
+        return _mm512_mask_permutexvar_epi8(blueGreen, BytesOf(2), places_, rgb.red);
+    }
+
+private:
+    __m512i places_ = kPlaces.Load();
+};
+
+template <class Memory>
 class Bgr24Target {
 public:
     template <class Columns>
     void operator()(Columns columns, uint8_t* row, ptrdiff_t x, const Rgb& rgb) const {
-        StoreThird<0>(columns, row + 3 * x, rgb);
-        StoreThird<1>(columns, row + 3 * x, rgb);
-        StoreThird<2>(columns, row + 3 * x, rgb);
+        uint8_t* const target = row + 3 * x;
+        const ptrdiff_t bytes = 3 * columns.count;
+        Store<Memory>(columns, target, bytes, first_(rgb));
+        Store<Memory>(columns, target + 64, bytes - 64, second_(rgb));
+        Store<Memory>(columns, target + 128, bytes - 128, third_(rgb));
     }
 
 private:
-    template <int kThird, class Columns>
-    static void StoreThird(Columns columns, uint8_t* target, const Rgb& rgb) {
-        static constexpr Table kPlaces = Bgr24Places(kThird);
-        const __m512i places = kPlaces.Load();
-        const __m512i blueGreen = _mm512_permutex2var_epi8(rgb.blue, places, rgb.green);
-        const __m512i bytes = _mm512_mask_permutexvar_epi8(blueGreen, Bgr24Reds(kThird), places, rgb.red);
-        Store(columns, target + 64 * kThird, 3 * columns.count - 64 * kThird, bytes);
-    }
+    Bgr24Third<0> first_;
+    Bgr24Third<1> second_;
+    Bgr24Third<2> third_;
 };
 
 /// Pixels of four bytes; the fourth becomes 255, or is not stored at all.
-template <bool kOpaque>
+template <class Memory, bool kOpaque>
 class Bgr32Target {
 public:
     template <class Columns>
@@ -491,7 +573,7 @@ private:
     static void StorePixels(Columns columns, uint8_t* target, ptrdiff_t bytes, __m512i pixels) {
         constexpr uint64_t kColours = 0x7777777777777777;
         if constexpr (kOpaque)
-            Store(columns, target, bytes, pixels);
+            Store<Memory>(columns, target, bytes, pixels);
         else if constexpr (Columns::kMasked)
             _mm512_mask_storeu_epi8(target, Bits(bytes) & kColours, pixels);
         else
@@ -513,22 +595,35 @@ private:
     __m512i places_ = kPlaces.Load();
 };
 
-template <class Target, class Form>
-void RgbFrom420(RowPair<uint8_t> rgb, RowPair<const uint8_t> y, const uint8_t* u, const uint8_t* v,
-                ptrdiff_t width) {
+/// Calls visit(target, source) for the pairs of rows of a packed target.
+template <class Visit>
+void ForSourcePairs(Rows target, const Planes420& source, ptrdiff_t height, Visit visit) {
+    ForRowPairs(height, [&](ptrdiff_t row0, ptrdiff_t row1, ptrdiff_t half) {
+        visit(target.Targets(row0, row1),
+              PlanesPair<const uint8_t>{source.y.Sources(row0, row1), source.u[half], source.v[half]});
+    });
+}
+
+template <class Memory, class Target, class Form, From420 RowKernels::*kKernel>
+void RgbFrom420(Rows rgb, Planes420 source, Size size) {
+    if (IsNarrow<kStep>(size))
+        return (kAvx2Kernels.*kKernel)(rgb, source, size);
     // Groups of four pixels, as 32-bit places.
     static constexpr Table kLuma = MakeTable([](int i) { return i % 4 == 0 ? PixelAt(i) / 4 : 0; });
     const ChromaWords words;
     const Target store;
     const __m512i order = kLuma.Load();
-    ForSteps<kRgbFromStep>(width, [&](ptrdiff_t x, auto columns) {
-        const ChromaTerms<Form> terms(words(columns, u, x), words(columns, v, x));
-        const auto luma = [&](const uint8_t* row) {
-            return _mm512_permutexvar_epi32(order, Load(columns, row + x, columns.count));
-        };
-        store(columns, rgb.first, x, ToRgb<Form>(luma(y.first), terms));
-        store(columns, rgb.second, x, ToRgb<Form>(luma(y.second), terms));
+    ForSourcePairs(rgb, source, size.height, [&](RowPair<uint8_t> to, const auto& from) {
+        ForSteps<kStep>(size.width, [&](ptrdiff_t x, auto columns) {
+            const ChromaTerms<Form> terms(words(columns, from.u, x), words(columns, from.v, x));
+            const auto luma = [&](const uint8_t* row) {
+                return _mm512_permutexvar_epi32(order, Load(columns, row + x, columns.count));
+            };
+            store(columns, to.first, x, ToRgb<Form>(luma(from.y.first), terms));
+            store(columns, to.second, x, ToRgb<Form>(luma(from.y.second), terms));
+        });
     });
+    Memory::Finish();
 }
 
 // Packed 4:2:2 ----------------------------------------------------------------------------------------------
@@ -546,28 +641,44 @@ PackedRun LoadPacked(Columns columns, const uint8_t* row, ptrdiff_t x) {
     return {Load(columns, row + 2 * x, bytes), Load(columns, row + 2 * x + 64, bytes - 64)};
 }
 
-__m512i Pick(const PackedRun& run, __m512i places) {
-    return _mm512_permutex2var_epi8(run.first, places, run.second);
-}
+/// Samples of a packed run.
+class Pick {
+public:
+    explicit Pick(const Table& places) : places_(places.Load()), fromSecond_(places.FromSecond()) {}
+    __m512i operator()(const PackedRun& run) const {
+        return PermutePair(run.first, run.second, places_, fromSecond_);
+    }
 
-template <PackedOrder kOrder>
-void Bgr24FromPacked(uint8_t* rgb, const uint8_t* packed, ptrdiff_t width) {
+private:
+    __m512i places_;
+    uint64_t fromSecond_;
+};
+
+template <class Memory, PackedOrder kOrder>
+void Bgr24FromPacked(Rows rgb, Rows packed, Size size) {
+    if (IsNarrow<kStep>(size))
+        return kAvx2Kernels.bgr24FromPacked[kOrder](rgb, packed, size);
     using Form = FastYuvForm;
     using Order = Packed<kOrder>;
     static constexpr Table kLuma = MakeTable([](int i) { return Order::Y(PixelAt(i)); });
     static constexpr Table kU = MakeTable([](int i) { return Order::U(PixelAt(i)); });
     static constexpr Table kV = MakeTable([](int i) { return Order::V(PixelAt(i)); });
-    const Bgr24Target store;
+    const Bgr24Target<Memory> store;
     const __m512i lowBytes = _mm512_set1_epi16(0xFF);
-    const __m512i lumaPlaces = kLuma.Load();
-    const __m512i uPlaces = kU.Load();
-    const __m512i vPlaces = kV.Load();
-    ForSteps<kRgbFromStep>(width, [&](ptrdiff_t x, auto columns) {
-        const PackedRun run = LoadPacked<kOrder>(columns, packed, x);
-        const ChromaTerms<Form> terms(_mm512_and_si512(Pick(run, uPlaces), lowBytes),
-                                      _mm512_and_si512(Pick(run, vPlaces), lowBytes));
-        store(columns, rgb, x, ToRgb<Form>(Pick(run, lumaPlaces), terms));
-    });
+    const Pick luma(kLuma);
+    const Pick u(kU);
+    const Pick v(kV);
+    for (ptrdiff_t row = 0; row < size.height; ++row) {
+        uint8_t* const target = rgb[row];
+        const uint8_t* const source = packed[row];
+        ForSteps<kStep>(size.width, [&](ptrdiff_t x, auto columns) {
+            const PackedRun run = LoadPacked<kOrder>(columns, source, x);
+            const ChromaTerms<Form> terms(_mm512_and_si512(u(run), lowBytes),
+                                          _mm512_and_si512(v(run), lowBytes));
+            store(columns, target, x, ToRgb<Form>(luma(run), terms));
+        });
+    }
+    Memory::Finish();
 }
 
 __m512i TruncatedAverage(__m512i a, __m512i b) {
@@ -577,27 +688,32 @@ __m512i TruncatedAverage(__m512i a, __m512i b) {
 }
 
 template <PackedOrder kOrder>
-void PackedTo420(RowPair<uint8_t> y, uint8_t* u, uint8_t* v, RowPair<const uint8_t> packed, ptrdiff_t width) {
+void PackedTo420(Planes420 target, Rows packed, Size size) {
+    if (IsNarrow<kStep>(size))
+        return kAvx2Kernels.packedTo420[kOrder](target, packed, size);
     using Order = Packed<kOrder>;
     static constexpr Table kLuma = MakeTable([](int i) { return Order::Y(i); });
     static constexpr Table kChroma =
         MakeTable([](int i) { return i < 32 ? Order::U(2 * i) : Order::V(2 * (i - 32)); });
-    const __m512i lumaPlaces = kLuma.Load();
-    const __m512i chromaPlaces = kChroma.Load();
-    ForSteps<64>(width, [&](ptrdiff_t x, auto columns) {
-        const PackedRun upper = LoadPacked<kOrder>(columns, packed.first, x);
-        const PackedRun lower = LoadPacked<kOrder>(columns, packed.second, x);
-        Store(columns, y.first + x, columns.count, Pick(upper, lumaPlaces));
-        Store(columns, y.second + x, columns.count, Pick(lower, lumaPlaces));
-        const __m512i chroma = TruncatedAverage(Pick(upper, chromaPlaces), Pick(lower, chromaPlaces));
-        StoreHalf(columns, u + x / 2, columns.count / 2, _mm512_castsi512_si256(chroma));
-        StoreHalf(columns, v + x / 2, columns.count / 2, _mm512_extracti64x4_epi64(chroma, 1));
+    const Pick luma(kLuma);
+    const Pick chroma(kChroma);
+    ForTargetPairs(target, packed, size.height, [&](const auto& to, auto from, ptrdiff_t, ptrdiff_t) {
+        ForSteps<kStep>(size.width, [&](ptrdiff_t x, auto columns) {
+            const PackedRun upper = LoadPacked<kOrder>(columns, from.first, x);
+            const PackedRun lower = LoadPacked<kOrder>(columns, from.second, x);
+            Store<Cached>(columns, to.y.first + x, columns.count, luma(upper));
+            Store<Cached>(columns, to.y.second + x, columns.count, luma(lower));
+            const __m512i uv = TruncatedAverage(chroma(upper), chroma(lower));
+            StoreHalf(columns, to.u + x / 2, columns.count / 2, _mm512_castsi512_si256(uv));
+            StoreHalf(columns, to.v + x / 2, columns.count / 2, _mm512_extracti64x4_epi64(uv, 1));
+        });
     });
 }
 
-template <PackedOrder kOrder>
-void PackedFrom420(RowPair<uint8_t> packed, RowPair<const uint8_t> y, const uint8_t* u, const uint8_t* v,
-                   ptrdiff_t width) {
+template <class Memory, PackedOrder kOrder>
+void PackedFrom420(Rows packed, Planes420 source, Size size) {
+    if (IsNarrow<kStep>(size))
+        return kAvx2Kernels.packedFrom420[kOrder](packed, source, size);
     // The second register holds 32 bytes of U, then 32 of V.
     static constexpr auto kPlaces = [](int firstPixel) {
         return MakeTable([=](int i) {
@@ -609,88 +725,130 @@ void PackedFrom420(RowPair<uint8_t> packed, RowPair<const uint8_t> y, const uint
     };
     static constexpr Table kFirst = kPlaces(0);
     static constexpr Table kSecond = kPlaces(32);
-    const __m512i firstPlaces = kFirst.Load();
-    const __m512i secondPlaces = kSecond.Load();
-    ForSteps<64>(width, [&](ptrdiff_t x, auto columns) {
-        const __m256i uBytes = LoadHalf(columns, u + x / 2, columns.count / 2);
-        const __m256i vBytes = LoadHalf(columns, v + x / 2, columns.count / 2);
-        const __m512i chroma = _mm512_inserti64x4(_mm512_castsi256_si512(uBytes), vBytes, 1);
-        const auto store = [&](uint8_t* target, const uint8_t* source) {
-            const PackedRun run{Load(columns, source, columns.count), chroma};
-            Store(columns, target, 2 * columns.count, Pick(run, firstPlaces));
-            Store(columns, target + 64, 2 * columns.count - 64, Pick(run, secondPlaces));
-        };
-        store(packed.first + 2 * x, y.first + x);
-        store(packed.second + 2 * x, y.second + x);
+    const Pick first(kFirst);
+    const Pick second(kSecond);
+    ForSourcePairs(packed, source, size.height, [&](RowPair<uint8_t> to, const auto& from) {
+        ForSteps<kStep>(size.width, [&](ptrdiff_t x, auto columns) {
+            const __m256i u = LoadHalf(columns, from.u + x / 2, columns.count / 2);
+            const __m256i v = LoadHalf(columns, from.v + x / 2, columns.count / 2);
+            const __m512i chroma = _mm512_inserti64x4(_mm512_castsi256_si512(u), v, 1);
+            const auto store = [&](uint8_t* target, const uint8_t* luma) {
+                const PackedRun run{Load(columns, luma, columns.count), chroma};
+                Store<Memory>(columns, target, 2 * columns.count, first(run));
+                Store<Memory>(columns, target + 64, 2 * columns.count - 64, second(run));
+            };
+            store(to.first + 2 * x, from.y.first + x);
+            store(to.second + 2 * x, from.y.second + x);
+        });
     });
+    Memory::Finish();
 }
 
-void SwapPacked(uint8_t* target, const uint8_t* source, ptrdiff_t width) {
+template <class Memory>
+void SwapPacked(Rows target, Rows source, Size size) {
     static constexpr Table kSwapped = MakeTable([](int i) { return i % 16 ^ 1; });
-    ForSteps<32>(width, [&](ptrdiff_t x, auto columns) {
-        const __m512i bytes = Load(columns, source + 2 * x, 2 * columns.count);
-        Store(columns, target + 2 * x, 2 * columns.count, _mm512_shuffle_epi8(bytes, kSwapped.Load()));
-    });
+    const __m512i swapped = kSwapped.Load();
+    for (ptrdiff_t row = 0; row < size.height; ++row) {
+        uint8_t* const to = target[row];
+        const uint8_t* const from = source[row];
+        ForSteps<32>(size.width, [&](ptrdiff_t x, auto columns) {
+            const __m512i bytes = Load(columns, from + 2 * x, 2 * columns.count);
+            Store<Memory>(columns, to + 2 * x, 2 * columns.count, _mm512_shuffle_epi8(bytes, swapped));
+        });
+    }
+    Memory::Finish();
+}
+
+/// Longer registers gain nothing here.
+void Copy(Rows target, Rows source, Size size) {
+    kAvx2Kernels.copy(target, source, size);
 }
 
 // Planes ----------------------------------------------------------------------------------------------------
 
-void Halve(uint8_t* target, RowPair<const uint8_t> source, ptrdiff_t width) {
+constexpr int kHalveStep = 128;
+
+void Halve(Rows target, Rows source, Size size) {
     // 64 times a sum of four has the truncated average in its high byte.
     static constexpr Table kHighBytes = MakeTable([](int i) { return 2 * i + 1; });
     static constexpr Table kEvenTwice = MakeTable([](int i) { return i % 16 & ~1; });
+    if (IsNarrow<kHalveStep>(size))
+        return kAvx2Kernels.halve(target, source, size);
     const __m512i weights = _mm512_set1_epi8(64);
-    ForSteps<128>(width, [&](ptrdiff_t x, auto columns) {
-        const auto pairSums = [&](const uint8_t* row, ptrdiff_t skipped) {
-            const ptrdiff_t bytes = columns.count - skipped;
-            __m512i samples = Load(columns, row + x + skipped, bytes);
-            if constexpr (decltype(columns)::kMasked) {
-                if (bytes % 2 != 0) {
-                    const uint64_t missing = Bits(bytes + 1) ^ Bits(bytes);
-                    samples = _mm512_mask_shuffle_epi8(samples, missing, samples, kEvenTwice.Load());
+    const __m512i highBytes = kHighBytes.Load();
+    ForRowPairs(size.height, [&](ptrdiff_t row0, ptrdiff_t row1, ptrdiff_t half) {
+        const auto from = source.Sources(row0, row1);
+        uint8_t* const to = target[half];
+        ForSteps<kHalveStep>(size.width, [&](ptrdiff_t x, auto columns) {
+            const auto pairSums = [&](const uint8_t* row, ptrdiff_t skipped) {
+                const ptrdiff_t bytes = columns.count - skipped;
+                __m512i samples = Load(columns, row + x + skipped, bytes);
+                if constexpr (decltype(columns)::kMasked) {
+                    if (bytes % 2 != 0) {
+                        const uint64_t missing = Bits(bytes + 1) ^ Bits(bytes);
+                        samples = _mm512_mask_shuffle_epi8(samples, missing, samples, kEvenTwice.Load());
+                    }
                 }
-            }
-            return _mm512_maddubs_epi16(samples, weights);
-        };
-        const __m512i first = _mm512_add_epi16(pairSums(source.first, 0), pairSums(source.second, 0));
-        const __m512i second = _mm512_add_epi16(pairSums(source.first, 64), pairSums(source.second, 64));
-        Store(columns, target + x / 2, (columns.count + 1) / 2,
-              _mm512_permutex2var_epi8(first, kHighBytes.Load(), second));
+                return _mm512_maddubs_epi16(samples, weights);
+            };
+            const __m512i first = _mm512_add_epi16(pairSums(from.first, 0), pairSums(from.second, 0));
+            const __m512i second = _mm512_add_epi16(pairSums(from.first, 64), pairSums(from.second, 64));
+            Store<Cached>(columns, to + x / 2, (columns.count + 1) / 2,
+                          PermutePair(first, second, highBytes, kHighBytes.FromSecond()));
+        });
     });
 }
 
-void Doubled(RowPair<uint8_t> target, const uint8_t* source, ptrdiff_t width) {
+void Doubled(Rows target, Rows source, Size size) {
+    if (IsNarrow<kStep>(size))
+        return kAvx2Kernels.doubled(target, source, size);
     static constexpr Table kFirst = MakeTable([](int i) { return i / 2; });
     static constexpr Table kSecond = MakeTable([](int i) { return 32 + i / 2; });
-    ForSteps<64>(width, [&](ptrdiff_t x, auto columns) {
-        const __m512i samples = Load(columns, source + x, columns.count);
-        const __m512i first = _mm512_permutexvar_epi8(kFirst.Load(), samples);
-        const __m512i second = _mm512_permutexvar_epi8(kSecond.Load(), samples);
-        for (uint8_t* const row : {target.first + 2 * x, target.second + 2 * x}) {
-            Store(columns, row, 2 * columns.count, first);
-            Store(columns, row + 64, 2 * columns.count - 64, second);
-        }
-    });
+    const __m512i firstPlaces = kFirst.Load();
+    const __m512i secondPlaces = kSecond.Load();
+    for (ptrdiff_t row = 0; row < size.height; ++row) {
+        const auto to = target.Targets(2 * row, 2 * row + 1);
+        const uint8_t* const from = source[row];
+        ForSteps<kStep>(size.width, [&](ptrdiff_t x, auto columns) {
+            const __m512i samples = Load(columns, from + x, columns.count);
+            const __m512i first = _mm512_permutexvar_epi8(firstPlaces, samples);
+            const __m512i second = _mm512_permutexvar_epi8(secondPlaces, samples);
+            for (uint8_t* const doubled : {to.first + 2 * x, to.second + 2 * x}) {
+                Store<Cached>(columns, doubled, 2 * columns.count, first);
+                Store<Cached>(columns, doubled + 64, 2 * columns.count - 64, second);
+            }
+        });
+    }
 }
+
+template <class Memory>
+constexpr RowKernels MakeKernels(const RowKernels* large) {
+    using Target24 = Bgr24Target<Memory>;
+    return {
+        .bgr32To420 = RgbTo420<FastRgbForm, Bgr32, &RowKernels::bgr32To420>,
+        .bgr24To420 = RgbTo420<FastRgbForm, Bgr24, &RowKernels::bgr24To420>,
+        .bgr24To420Simple = RgbTo420<SimpleRgbForm, Bgr24, &RowKernels::bgr24To420Simple>,
+        .bgra32To420 = Bgra32To420,
+        .bgr24From420 = RgbFrom420<Memory, Target24, FastYuvForm, &RowKernels::bgr24From420>,
+        .bgr24From420Simple = RgbFrom420<Memory, Target24, SimpleYuvForm, &RowKernels::bgr24From420Simple>,
+        .bgrxFrom420 = RgbFrom420<Memory, Bgr32Target<Memory, false>, FastYuvForm, &RowKernels::bgrxFrom420>,
+        .bgraFrom420 = RgbFrom420<Memory, Bgr32Target<Memory, true>, FastYuvForm, &RowKernels::bgraFrom420>,
+        .packedTo420 = {PackedTo420<kUyvy>, PackedTo420<kYuy2>},
+        .packedFrom420 = {PackedFrom420<Memory, kUyvy>, PackedFrom420<Memory, kYuy2>},
+        .packedFromBgr24 = {PackedFromBgr24<Memory, kUyvy>, PackedFromBgr24<Memory, kYuy2>},
+        .bgr24FromPacked = {Bgr24FromPacked<Memory, kUyvy>, Bgr24FromPacked<Memory, kYuy2>},
+        .swapPacked = SwapPacked<Memory>,
+        .copy = Copy,
+        .halve = Halve,
+        .doubled = Doubled,
+        .large = large,
+    };
+}
+
+constexpr RowKernels kLargeKernels = MakeKernels<Streamed>(nullptr);
 
 } // namespace
 
-constinit const RowKernels kAvx512Kernels = {
-    .bgr32To420 = RgbTo420<FastRgbForm, Bgr32>,
-    .bgr24To420 = RgbTo420<FastRgbForm, Bgr24>,
-    .bgr24To420Simple = RgbTo420<SimpleRgbForm, Bgr24>,
-    .bgra32To420 = Bgra32To420,
-    .bgr24From420 = RgbFrom420<Bgr24Target, FastYuvForm>,
-    .bgr24From420Simple = RgbFrom420<Bgr24Target, SimpleYuvForm>,
-    .bgrxFrom420 = RgbFrom420<Bgr32Target<false>, FastYuvForm>,
-    .bgraFrom420 = RgbFrom420<Bgr32Target<true>, FastYuvForm>,
-    .packedTo420 = {PackedTo420<kUyvy>, PackedTo420<kYuy2>},
-    .packedFrom420 = {PackedFrom420<kUyvy>, PackedFrom420<kYuy2>},
-    .packedFromBgr24 = {PackedFromBgr24<kUyvy>, PackedFromBgr24<kYuy2>},
-    .bgr24FromPacked = {Bgr24FromPacked<kUyvy>, Bgr24FromPacked<kYuy2>},
-    .swapPacked = SwapPacked,
-    .halve = Halve,
-    .doubled = Doubled,
-};
+constinit const RowKernels kAvx512Kernels = MakeKernels<Cached>(&kLargeKernels);
 
 } // namespace image

@@ -34,7 +34,7 @@ struct Sse41 {
         StoreHalf(high, _mm_unpackhi_epi64(a, a));
     }
 
-    static void FinishRow() {}
+    static void FinishPicture() {}
 
     static Vec Lane(const LaneBytes& bytes) {
         return _mm_loadu_si128(reinterpret_cast<const Vec*>(bytes.data()));
