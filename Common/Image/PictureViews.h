@@ -11,10 +11,9 @@
 namespace image {
 
 /// Two rows that share chroma; the same row twice at the end of an odd height.
-template <class Byte>
 struct RowPair {
-    Byte* first;
-    Byte* second;
+    uint8_t* first;
+    uint8_t* second;
 };
 
 /// Rows of a picture or plane from the top: the first byte of row 0, and the signed distance to the next row.
@@ -33,10 +32,7 @@ struct Rows {
         return {(*this)[row] + byte, step};
     }
 
-    [[gnu::always_inline]] RowPair<uint8_t> Targets(ptrdiff_t row0, ptrdiff_t row1) const {
-        return {(*this)[row0], (*this)[row1]};
-    }
-    [[gnu::always_inline]] RowPair<const uint8_t> Sources(ptrdiff_t row0, ptrdiff_t row1) const {
+    [[gnu::always_inline]] RowPair Pair(ptrdiff_t row0, ptrdiff_t row1) const {
         return {(*this)[row0], (*this)[row1]};
     }
 };
@@ -62,6 +58,13 @@ struct Planes420 {
     }
 };
 
+/// Two rows of luma and the row of chroma that they share.
+struct PlanesPair {
+    RowPair y;
+    uint8_t* u;
+    uint8_t* v;
+};
+
 /// A packed picture with its size in pixels.
 struct Picture {
     Rows rows;
@@ -83,6 +86,17 @@ template <class Visit>
 [[gnu::always_inline]] inline void ForRowPairs(ptrdiff_t height, Visit visit) {
     for (ptrdiff_t row = 0; row < height; row += 2)
         visit(row, row + 1 < height ? row + 1 : row, row / 2);
+}
+
+/// Calls visit(planes, packed, row0, row1) for every pair of rows of a picture that is both planar and
+/// packed, the one made from the other.
+template <class Visit>
+[[gnu::always_inline]] inline void ForRowPairs(const Planes420& planes, Rows packed, ptrdiff_t height,
+                                               Visit visit) {
+    ForRowPairs(height, [&](ptrdiff_t row0, ptrdiff_t row1, ptrdiff_t half) {
+        visit(PlanesPair{planes.y.Pair(row0, row1), planes.u[half], planes.v[half]}, packed.Pair(row0, row1),
+              row0, row1);
+    });
 }
 
 } // namespace image

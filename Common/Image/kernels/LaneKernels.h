@@ -56,9 +56,11 @@ class LaneKernels {
     /// The size of what is left of a pair of rows.
     static Size LastColumn(ptrdiff_t row0, ptrdiff_t row1) { return {1, row1 - row0 + 1}; }
 
-    template <class Byte>
-    static RowPair<Byte> Advance(RowPair<Byte> rows, ptrdiff_t bytes) {
+    static RowPair Advance(RowPair rows, ptrdiff_t bytes) {
         return {rows.first + bytes, rows.second + bytes};
+    }
+    static PlanesPair Advance(PlanesPair planes, ptrdiff_t columns) {
+        return {Advance(planes.y, columns), planes.u + columns / 2, planes.v + columns / 2};
     }
 
     /// Asks for what the blocks a little further on will read: with two rows read and up to six written, the
@@ -214,8 +216,7 @@ class LaneKernels {
 
     /// `useBytes` is called with the index of each row and its pixels as they were loaded.
     template <class Format, class Form, class UseBytes>
-    static void RgbBlockTo420(RowPair<uint8_t> y, uint8_t* u, uint8_t* v, RowPair<const uint8_t> rgb,
-                              UseBytes useBytes) {
+    static void RgbBlockTo420(PlanesPair target, RowPair rgb, UseBytes useBytes) {
         const auto convert = [&](RowIndex index, uint8_t* luma, const uint8_t* row) {
             Prefetch(row, Format::kBytes * kPixels);
             const Quads bytes = Format::Load(row);
@@ -224,57 +225,49 @@ class LaneKernels {
             V::Store(luma, Luma<Form>(pixels));
             return PixelChroma<Form>(pixels);
         };
-        const Quads first = convert(kFirst, y.first, rgb.first);
-        const Quads second = convert(kSecond, y.second, rgb.second);
-        StoreAlternating(u, v, StoredChroma<2>(AddRows(first, second)));
+        const Quads first = convert(kFirst, target.y.first, rgb.first);
+        const Quads second = convert(kSecond, target.y.second, rgb.second);
+        StoreAlternating(target.u, target.v, StoredChroma<2>(AddRows(first, second)));
     }
 
     template <class Format, class Form, To420 RowKernels::*kKernel>
     [[gnu::flatten]] static void RgbTo420(Planes420 target, Rows rgb, Size size) {
         if (size.width < kPixels)
             return (V::Lower().*kKernel)(target, rgb, size);
-        ForRowPairs(size.height, [&](ptrdiff_t row0, ptrdiff_t row1, ptrdiff_t half) {
-            const auto y = target.y.Targets(row0, row1);
-            const auto source = rgb.Sources(row0, row1);
-            uint8_t* const u = target.u[half];
-            uint8_t* const v = target.v[half];
-            ForBlocks(
-                size.width, kPixels,
-                [&](ptrdiff_t x) {
-                    RgbBlockTo420<Format, Form>(Advance(y, x), u + x / 2, v + x / 2,
-                                                Advance(source, Format::kBytes * x),
-                                                [](RowIndex, const Quads&) {});
-                },
-                [&](ptrdiff_t x) {
-                    (kPlainKernels.*kKernel)(target.At(x, row0), rgb.At(row0, Format::kBytes * x),
-                                             LastColumn(row0, row1));
-                });
-        });
+        ForRowPairs(target, rgb, size.height,
+                    [&](PlanesPair to, RowPair from, ptrdiff_t row0, ptrdiff_t row1) {
+                        ForBlocks(
+                            size.width, kPixels,
+                            [&](ptrdiff_t x) {
+                                RgbBlockTo420<Format, Form>(Advance(to, x), Advance(from, Format::kBytes * x),
+                                                            [](RowIndex, const Quads&) {});
+                            },
+                            [&](ptrdiff_t x) {
+                                (kPlainKernels.*kKernel)(target.At(x, row0), rgb.At(row0, Format::kBytes * x),
+                                                         LastColumn(row0, row1));
+                            });
+                    });
         V::FinishPicture();
     }
 
     [[gnu::flatten]] static void RgbaTo420(Planes420 target, Rows alpha, Rows bgra, Size size) {
         if (size.width < kPixels)
             return V::Lower().bgra32To420(target, alpha, bgra, size);
-        ForRowPairs(size.height, [&](ptrdiff_t row0, ptrdiff_t row1, ptrdiff_t half) {
-            const auto y = target.y.Targets(row0, row1);
-            const auto source = bgra.Sources(row0, row1);
-            uint8_t* const u = target.u[half];
-            uint8_t* const v = target.v[half];
-            ForBlocks(
-                size.width, kPixels,
-                [&](ptrdiff_t x) {
-                    const auto storeAlpha = [&](RowIndex row, const Quads& bytes) {
-                        V::Store(alpha[row == kFirst ? row0 : row1] + x, Bgr32::Alpha(bytes));
-                    };
-                    RgbBlockTo420<Bgr32, FastRgbForm>(Advance(y, x), u + x / 2, v + x / 2,
-                                                      Advance(source, 4 * x), storeAlpha);
-                },
-                [&](ptrdiff_t x) {
-                    kPlainKernels.bgra32To420(target.At(x, row0), alpha.At(row0, x), bgra.At(row0, 4 * x),
-                                              LastColumn(row0, row1));
-                });
-        });
+        ForRowPairs(
+            target, bgra, size.height, [&](PlanesPair to, RowPair from, ptrdiff_t row0, ptrdiff_t row1) {
+                ForBlocks(
+                    size.width, kPixels,
+                    [&](ptrdiff_t x) {
+                        const auto storeAlpha = [&](RowIndex row, const Quads& bytes) {
+                            V::Store(alpha[row == kFirst ? row0 : row1] + x, Bgr32::Alpha(bytes));
+                        };
+                        RgbBlockTo420<Bgr32, FastRgbForm>(Advance(to, x), Advance(from, 4 * x), storeAlpha);
+                    },
+                    [&](ptrdiff_t x) {
+                        kPlainKernels.bgra32To420(target.At(x, row0), alpha.At(row0, x), bgra.At(row0, 4 * x),
+                                                  LastColumn(row0, row1));
+                    });
+            });
         V::FinishPicture();
     }
 
@@ -402,25 +395,22 @@ class LaneKernels {
     [[gnu::flatten]] static void RgbFrom420(Rows rgb, Planes420 source, Size size) {
         if (size.width < kPixels)
             return (V::Lower().*kKernel)(rgb, source, size);
-        ForRowPairs(size.height, [&](ptrdiff_t row0, ptrdiff_t row1, ptrdiff_t half) {
-            const auto target = rgb.Targets(row0, row1);
-            const auto y = source.y.Sources(row0, row1);
-            const uint8_t* const u = source.u[half];
-            const uint8_t* const v = source.v[half];
-            ForBlocks(
-                size.width, kPixels,
-                [&](ptrdiff_t x) {
-                    const ChromaTerms terms = MakeTerms<Form>(V::LoadAlternating(u + x / 2, v + x / 2));
-                    Target::Store(target.first + Target::kBytes * x,
-                                  MakeComponents<Form>(V::Load(y.first + x), terms));
-                    Target::Store(target.second + Target::kBytes * x,
-                                  MakeComponents<Form>(V::Load(y.second + x), terms));
-                },
-                [&](ptrdiff_t x) {
-                    (kPlainKernels.*kKernel)(rgb.At(row0, Target::kBytes * x), source.At(x, row0),
-                                             LastColumn(row0, row1));
-                });
-        });
+        ForRowPairs(
+            source, rgb, size.height, [&](PlanesPair from, RowPair to, ptrdiff_t row0, ptrdiff_t row1) {
+                ForBlocks(
+                    size.width, kPixels,
+                    [&](ptrdiff_t x) {
+                        const PlanesPair at = Advance(from, x);
+                        const RowPair pixels = Advance(to, Target::kBytes * x);
+                        const ChromaTerms terms = MakeTerms<Form>(V::LoadAlternating(at.u, at.v));
+                        Target::Store(pixels.first, MakeComponents<Form>(V::Load(at.y.first), terms));
+                        Target::Store(pixels.second, MakeComponents<Form>(V::Load(at.y.second), terms));
+                    },
+                    [&](ptrdiff_t x) {
+                        (kPlainKernels.*kKernel)(rgb.At(row0, Target::kBytes * x), source.At(x, row0),
+                                                 LastColumn(row0, row1));
+                    });
+            });
         V::FinishPicture();
     }
 
@@ -458,7 +448,7 @@ class LaneKernels {
     }
 
     template <PackedOrder kOrder>
-    static void PackedBlockTo420(RowPair<uint8_t> y, uint8_t* u, uint8_t* v, RowPair<const uint8_t> packed) {
+    static void PackedBlockTo420(PlanesPair target, RowPair packed) {
         constexpr LaneBytes kApart{0, 4, 8, 12, 1, 5, 9, 13, 2, 6, 10, 14, 3, 7, 11, 15};
         const auto load = [](const uint8_t* row, int half) { return V::LoadLanes(row + 16 * half, 32); };
         const Vec first[2] = {load(packed.first, 0), load(packed.first, 1)};
@@ -472,23 +462,18 @@ class LaneKernels {
         };
         const Vec chroma = V::Blend8(HighBytes(average(first[0], second[0])), average(first[1], second[1]),
                                      V::Set16(-0x100));
-        V::Store(y.first, luma(first));
-        V::Store(y.second, luma(second));
-        V::StoreHalves(u, v, V::ExchangeMiddle(V::Shuffle8(chroma, V::Lane(kApart))));
+        V::Store(target.y.first, luma(first));
+        V::Store(target.y.second, luma(second));
+        V::StoreHalves(target.u, target.v, V::ExchangeMiddle(V::Shuffle8(chroma, V::Lane(kApart))));
     }
 
     template <PackedOrder kOrder>
     [[gnu::flatten]] static void PackedTo420(Planes420 target, Rows packed, Size size) {
         if (size.width < kPixels)
             return V::Lower().packedTo420[kOrder](target, packed, size);
-        ForRowPairs(size.height, [&](ptrdiff_t row0, ptrdiff_t row1, ptrdiff_t half) {
-            const auto y = target.y.Targets(row0, row1);
-            const auto source = packed.Sources(row0, row1);
-            uint8_t* const u = target.u[half];
-            uint8_t* const v = target.v[half];
-            ForBlocks(size.width, [&](ptrdiff_t x) {
-                PackedBlockTo420<kOrder>(Advance(y, x), u + x / 2, v + x / 2, Advance(source, 2 * x));
-            });
+        ForRowPairs(target, packed, size.height, [&](PlanesPair to, RowPair from, ptrdiff_t, ptrdiff_t) {
+            ForBlocks(size.width,
+                      [&](ptrdiff_t x) { PackedBlockTo420<kOrder>(Advance(to, x), Advance(from, 2 * x)); });
         });
         V::FinishPicture();
     }
@@ -497,15 +482,13 @@ class LaneKernels {
     [[gnu::flatten]] static void PackedFrom420(Rows packed, Planes420 source, Size size) {
         if (size.width < kPixels)
             return V::Lower().packedFrom420[kOrder](packed, source, size);
-        ForRowPairs(size.height, [&](ptrdiff_t row0, ptrdiff_t row1, ptrdiff_t half) {
-            const auto target = packed.Targets(row0, row1);
-            const auto y = source.y.Sources(row0, row1);
-            const uint8_t* const u = source.u[half];
-            const uint8_t* const v = source.v[half];
+        ForRowPairs(source, packed, size.height, [&](PlanesPair from, RowPair to, ptrdiff_t, ptrdiff_t) {
             ForBlocks(size.width, [&](ptrdiff_t x) {
-                const Vec uv = V::LoadAlternating(u + x / 2, v + x / 2);
-                StorePacked<kOrder>(target.first + 2 * x, V::Load(y.first + x), uv);
-                StorePacked<kOrder>(target.second + 2 * x, V::Load(y.second + x), uv);
+                const PlanesPair at = Advance(from, x);
+                const RowPair groups = Advance(to, 2 * x);
+                const Vec uv = V::LoadAlternating(at.u, at.v);
+                StorePacked<kOrder>(groups.first, V::Load(at.y.first), uv);
+                StorePacked<kOrder>(groups.second, V::Load(at.y.second), uv);
             });
         });
         V::FinishPicture();
@@ -589,7 +572,7 @@ class LaneKernels {
     template <class Block>
     static void HalveBy(ptrdiff_t blockPixels, Rows target, Rows source, Size size, Block block) {
         ForRowPairs(size.height, [&](ptrdiff_t row0, ptrdiff_t row1, ptrdiff_t half) {
-            const auto from = source.Sources(row0, row1);
+            const auto from = source.Pair(row0, row1);
             uint8_t* const to = target[half];
             ForBlocks(
                 size.width, blockPixels, [&](ptrdiff_t x) { block(to + x / 2, Advance(from, x)); },
@@ -601,7 +584,7 @@ class LaneKernels {
     }
 
     /// Averages of the four samples in each 2 x 2 of a vector's, as words.
-    static Vec BlockAverages(RowPair<const uint8_t> rows) {
+    static Vec BlockAverages(RowPair rows) {
         const Vec ones = V::Set8(1);
         return V::template Srl16<2>(
             V::Add16(V::MulAddU8S8(V::Load(rows.first), ones), V::MulAddU8S8(V::Load(rows.second), ones)));
@@ -612,12 +595,12 @@ class LaneKernels {
         if (size.width < kPixels)
             V::Lower().halve(target, source, size);
         else if (size.width < 2 * kPixels)
-            HalveBy(kPixels, target, source, size, [&](uint8_t* to, RowPair<const uint8_t> from) {
+            HalveBy(kPixels, target, source, size, [&](uint8_t* to, RowPair from) {
                 const Vec averages = BlockAverages(from);
                 V::StoreHalf(to, bytes(averages, averages));
             });
         else
-            HalveBy(2 * kPixels, target, source, size, [&](uint8_t* to, RowPair<const uint8_t> from) {
+            HalveBy(2 * kPixels, target, source, size, [&](uint8_t* to, RowPair from) {
                 V::Store(to, bytes(BlockAverages(from), BlockAverages(Advance(from, kPixels))));
             });
     }
@@ -625,7 +608,7 @@ class LaneKernels {
     template <class Block>
     static void DoubleBy(ptrdiff_t blockPixels, Rows target, Rows source, Size size, Block block) {
         for (ptrdiff_t row = 0; row < size.height; ++row) {
-            const auto to = target.Targets(2 * row, 2 * row + 1);
+            const auto to = target.Pair(2 * row, 2 * row + 1);
             const uint8_t* const from = source[row];
             ForBlocks(
                 size.width, blockPixels, [&](ptrdiff_t x) { block(Advance(to, 2 * x), from + x); },
@@ -640,13 +623,13 @@ class LaneKernels {
         if (size.width < kPixels / 2)
             V::Lower().doubled(target, source, size);
         else if (size.width < kPixels)
-            DoubleBy(kPixels / 2, target, source, size, [](RowPair<uint8_t> to, const uint8_t* from) {
+            DoubleBy(kPixels / 2, target, source, size, [](RowPair to, const uint8_t* from) {
                 const Vec twice = V::LoadAlternating(from, from);
                 V::Store(to.first, twice);
                 V::Store(to.second, twice);
             });
         else
-            DoubleBy(kPixels, target, source, size, [](RowPair<uint8_t> to, const uint8_t* from) {
+            DoubleBy(kPixels, target, source, size, [](RowPair to, const uint8_t* from) {
                 const Vec samples = V::Load(from);
                 StoreInterleaved(to.first, samples, samples);
                 StoreInterleaved(to.second, samples, samples);

@@ -25,21 +25,6 @@ Bgr LoadPixel(const uint8_t* p) {
     return {p[0], p[1], p[2]};
 }
 
-/// A block of 2 x 2 pixels and the place of its chroma; beyond an odd width or height the last column or row
-/// comes again.
-struct Block {
-    ptrdiff_t column0, column1, row0, row1;
-    ptrdiff_t column, row;
-};
-
-template <class Visit>
-void ForBlocks(Size size, Visit visit) {
-    ForRowPairs(size.height, [&](ptrdiff_t row0, ptrdiff_t row1, ptrdiff_t row) {
-        for (ptrdiff_t x = 0; x < size.width; x += 2)
-            visit(Block{x, std::min(x + 1, size.width - 1), row0, row1, x / 2, row});
-    });
-}
-
 template <class Equations>
 uint8_t Luma(Bgr p) {
     return Byte(Equations::Y(p.r, p.g, p.b));
@@ -56,27 +41,33 @@ int Cr(Bgr p) {
 }
 
 template <class Equations, int kPixelBytes>
-void RgbTo420(Planes420 target, Rows rgb, Size size) {
+void RgbTo420(Planes420 target, Rows source, Size size) {
     using E = Equations;
-    ForBlocks(size, [&](Block at) {
-        const Bgr a = LoadPixel(rgb[at.row0] + kPixelBytes * at.column0);
-        const Bgr b = LoadPixel(rgb[at.row0] + kPixelBytes * at.column1);
-        const Bgr c = LoadPixel(rgb[at.row1] + kPixelBytes * at.column0);
-        const Bgr d = LoadPixel(rgb[at.row1] + kPixelBytes * at.column1);
-        target.y[at.row0][at.column0] = Luma<E>(a);
-        target.y[at.row0][at.column1] = Luma<E>(b);
-        target.y[at.row1][at.column0] = Luma<E>(c);
-        target.y[at.row1][at.column1] = Luma<E>(d);
-        target.u[at.row][at.column] = Byte((Cb<E>(a) + Cb<E>(b) + Cb<E>(c) + Cb<E>(d)) >> 2);
-        target.v[at.row][at.column] = Byte((Cr<E>(a) + Cr<E>(b) + Cr<E>(c) + Cr<E>(d)) >> 2);
+    ForRowPairs(target, source, size.height, [&](PlanesPair to, RowPair rgb, ptrdiff_t, ptrdiff_t) {
+        for (ptrdiff_t x = 0; x < size.width; x += 2) {
+            const ptrdiff_t next = std::min(x + 1, size.width - 1);
+            const Bgr a = LoadPixel(rgb.first + kPixelBytes * x);
+            const Bgr b = LoadPixel(rgb.first + kPixelBytes * next);
+            const Bgr c = LoadPixel(rgb.second + kPixelBytes * x);
+            const Bgr d = LoadPixel(rgb.second + kPixelBytes * next);
+            to.y.first[x] = Luma<E>(a);
+            to.y.first[next] = Luma<E>(b);
+            to.y.second[x] = Luma<E>(c);
+            to.y.second[next] = Luma<E>(d);
+            to.u[x / 2] = Byte((Cb<E>(a) + Cb<E>(b) + Cb<E>(c) + Cb<E>(d)) >> 2);
+            to.v[x / 2] = Byte((Cr<E>(a) + Cr<E>(b) + Cr<E>(c) + Cr<E>(d)) >> 2);
+        }
     });
 }
 
 void Bgra32To420(Planes420 target, Rows alpha, Rows bgra, Size size) {
     RgbTo420<FastRgbToYuv, 4>(target, bgra, size);
-    for (ptrdiff_t row = 0; row < size.height; ++row)
+    for (ptrdiff_t row = 0; row < size.height; ++row) {
+        uint8_t* const to = alpha[row];
+        const uint8_t* const from = bgra[row];
         for (ptrdiff_t x = 0; x < size.width; ++x)
-            alpha[row][x] = bgra[row][4 * x + 3];
+            to[x] = from[4 * x + 3];
+    }
 }
 
 /// The chroma terms of a block, for each of its pixels.
@@ -111,15 +102,16 @@ struct BgraPixel {
 };
 
 template <class Equations, class Pixel>
-void RgbFrom420(Rows rgb, Planes420 source, Size size) {
-    ForBlocks(size, [&](Block at) {
-        const BlockColour<Equations> colour(source.u[at.row][at.column], source.v[at.row][at.column]);
-        for (const ptrdiff_t row : {at.row0, at.row1}) {
-            for (const ptrdiff_t x : {at.column0, at.column1}) {
-                uint8_t* const pixel = rgb[row] + Pixel::kBytes * x;
-                colour.StorePixel(pixel, source.y[row][x]);
-                Pixel::StoreFourth(pixel);
-            }
+void RgbFrom420(Rows target, Planes420 source, Size size) {
+    ForRowPairs(source, target, size.height, [&](PlanesPair from, RowPair rgb, ptrdiff_t, ptrdiff_t) {
+        for (ptrdiff_t x = 0; x < size.width; ++x) {
+            const BlockColour<Equations> colour(from.u[x / 2], from.v[x / 2]);
+            uint8_t* const first = rgb.first + Pixel::kBytes * x;
+            uint8_t* const second = rgb.second + Pixel::kBytes * x;
+            colour.StorePixel(first, from.y.first[x]);
+            colour.StorePixel(second, from.y.second[x]);
+            Pixel::StoreFourth(first);
+            Pixel::StoreFourth(second);
         }
     });
 }
@@ -141,68 +133,73 @@ struct Group {
 };
 
 template <PackedOrder kOrder>
-void PackedTo420(Planes420 target, Rows packed, Size size) {
+void PackedTo420(Planes420 target, Rows source, Size size) {
     using G = Group<kOrder>;
-    ForBlocks(size, [&](Block at) {
-        const uint8_t* const first = packed[at.row0] + 2 * at.column0;
-        const uint8_t* const second = packed[at.row1] + 2 * at.column0;
-        target.y[at.row0][at.column0] = first[G::kY0];
-        target.y[at.row0][at.column1] = first[G::kY1];
-        target.y[at.row1][at.column0] = second[G::kY0];
-        target.y[at.row1][at.column1] = second[G::kY1];
-        target.u[at.row][at.column] = Byte((first[G::kU] + second[G::kU]) >> 1);
-        target.v[at.row][at.column] = Byte((first[G::kV] + second[G::kV]) >> 1);
-    });
-}
-
-template <PackedOrder kOrder>
-void PackedFrom420(Rows packed, Planes420 source, Size size) {
-    ForBlocks(size, [&](Block at) {
-        for (const ptrdiff_t row : {at.row0, at.row1}) {
-            const uint8_t* const y = source.y[row];
-            Group<kOrder>::Store(packed[row] + 2 * at.column0, y[at.column0], y[at.column1],
-                                 source.u[at.row][at.column], source.v[at.row][at.column]);
+    ForRowPairs(target, source, size.height, [&](PlanesPair to, RowPair packed, ptrdiff_t, ptrdiff_t) {
+        for (ptrdiff_t x = 0; x < size.width; x += 2) {
+            const uint8_t* const first = packed.first + 2 * x;
+            const uint8_t* const second = packed.second + 2 * x;
+            to.y.first[x] = first[G::kY0];
+            to.y.first[x + 1] = first[G::kY1];
+            to.y.second[x] = second[G::kY0];
+            to.y.second[x + 1] = second[G::kY1];
+            to.u[x / 2] = Byte((first[G::kU] + second[G::kU]) >> 1);
+            to.v[x / 2] = Byte((first[G::kV] + second[G::kV]) >> 1);
         }
     });
 }
 
-/// Calls visit(row, x, next) for every two neighbouring pixels of a row; beyond an odd width the last one
-/// comes again.
-template <class Visit>
-void ForGroups(Size size, Visit visit) {
-    for (ptrdiff_t row = 0; row < size.height; ++row)
-        for (ptrdiff_t x = 0; x < size.width; x += 2)
-            visit(row, x, std::min(x + 1, size.width - 1));
-}
-
 template <PackedOrder kOrder>
-void PackedFromBgr24(Rows packed, Rows rgb, Size size) {
-    using E = FastRgbToYuv;
-    ForGroups(size, [&](ptrdiff_t row, ptrdiff_t x, ptrdiff_t next) {
-        const Bgr a = LoadPixel(rgb[row] + 3 * x);
-        const Bgr b = LoadPixel(rgb[row] + 3 * next);
-        Group<kOrder>::Store(packed[row] + 2 * x, Luma<E>(a), Luma<E>(b), Byte((Cb<E>(a) + Cb<E>(b)) >> 1),
-                             Byte((Cr<E>(a) + Cr<E>(b)) >> 1));
-    });
-}
-
-template <PackedOrder kOrder>
-void Bgr24FromPacked(Rows rgb, Rows packed, Size size) {
+void PackedFrom420(Rows target, Planes420 source, Size size) {
     using G = Group<kOrder>;
-    ForGroups(size, [&](ptrdiff_t row, ptrdiff_t x, ptrdiff_t next) {
-        const uint8_t* const group = packed[row] + 2 * x;
-        const BlockColour<FastYuvToRgb> colour(group[G::kU], group[G::kV]);
-        colour.StorePixel(rgb[row] + 3 * x, group[G::kY0]);
-        if (next != x)
-            colour.StorePixel(rgb[row] + 3 * next, group[G::kY1]);
+    ForRowPairs(source, target, size.height, [&](PlanesPair from, RowPair packed, ptrdiff_t, ptrdiff_t) {
+        for (ptrdiff_t x = 0; x < size.width; x += 2) {
+            const uint8_t u = from.u[x / 2];
+            const uint8_t v = from.v[x / 2];
+            G::Store(packed.first + 2 * x, from.y.first[x], from.y.first[x + 1], u, v);
+            G::Store(packed.second + 2 * x, from.y.second[x], from.y.second[x + 1], u, v);
+        }
     });
+}
+
+template <PackedOrder kOrder>
+void PackedFromBgr24(Rows target, Rows source, Size size) {
+    using E = FastRgbToYuv;
+    for (ptrdiff_t row = 0; row < size.height; ++row) {
+        uint8_t* const packed = target[row];
+        const uint8_t* const rgb = source[row];
+        for (ptrdiff_t x = 0; x < size.width; x += 2) {
+            const Bgr a = LoadPixel(rgb + 3 * x);
+            const Bgr b = LoadPixel(rgb + 3 * std::min(x + 1, size.width - 1));
+            Group<kOrder>::Store(packed + 2 * x, Luma<E>(a), Luma<E>(b), Byte((Cb<E>(a) + Cb<E>(b)) >> 1),
+                                 Byte((Cr<E>(a) + Cr<E>(b)) >> 1));
+        }
+    }
+}
+
+template <PackedOrder kOrder>
+void Bgr24FromPacked(Rows target, Rows source, Size size) {
+    using G = Group<kOrder>;
+    for (ptrdiff_t row = 0; row < size.height; ++row) {
+        uint8_t* const rgb = target[row];
+        const uint8_t* const packed = source[row];
+        for (ptrdiff_t x = 0; x < size.width; x += 2) {
+            const uint8_t* const group = packed + 2 * x;
+            const BlockColour<FastYuvToRgb> colour(group[G::kU], group[G::kV]);
+            colour.StorePixel(rgb + 3 * x, group[G::kY0]);
+            if (x + 1 < size.width)
+                colour.StorePixel(rgb + 3 * (x + 1), group[G::kY1]);
+        }
+    }
 }
 
 void SwapPacked(Rows target, Rows source, Size size) {
     for (ptrdiff_t row = 0; row < size.height; ++row) {
+        uint8_t* const to = target[row];
+        const uint8_t* const from = source[row];
         for (ptrdiff_t i = 0; i < 2 * size.width; i += 2) {
-            target[row][i] = source[row][i + 1];
-            target[row][i + 1] = source[row][i];
+            to[i] = from[i + 1];
+            to[i + 1] = from[i];
         }
     }
 }
@@ -213,19 +210,25 @@ void Copy(Rows target, Rows source, Size size) {
 }
 
 void Halve(Rows target, Rows source, Size size) {
-    ForBlocks(size, [&](Block at) {
-        const uint8_t* const first = source[at.row0];
-        const uint8_t* const second = source[at.row1];
-        target[at.row][at.column] =
-            Byte((first[at.column0] + first[at.column1] + second[at.column0] + second[at.column1]) >> 2);
+    ForRowPairs(size.height, [&](ptrdiff_t row0, ptrdiff_t row1, ptrdiff_t half) {
+        const RowPair from = source.Pair(row0, row1);
+        uint8_t* const to = target[half];
+        for (ptrdiff_t x = 0; x < size.width; x += 2) {
+            const ptrdiff_t next = std::min(x + 1, size.width - 1);
+            to[x / 2] = Byte((from.first[x] + from.first[next] + from.second[x] + from.second[next]) >> 2);
+        }
     });
 }
 
 void Doubled(Rows target, Rows source, Size size) {
-    for (ptrdiff_t row = 0; row < size.height; ++row)
-        for (ptrdiff_t x = 0; x < size.width; ++x)
-            for (uint8_t* const doubled : {target[2 * row] + 2 * x, target[2 * row + 1] + 2 * x})
-                doubled[0] = doubled[1] = source[row][x];
+    for (ptrdiff_t row = 0; row < size.height; ++row) {
+        const RowPair to = target.Pair(2 * row, 2 * row + 1);
+        const uint8_t* const from = source[row];
+        for (ptrdiff_t x = 0; x < size.width; ++x) {
+            to.first[2 * x] = to.first[2 * x + 1] = from[x];
+            to.second[2 * x] = to.second[2 * x + 1] = from[x];
+        }
+    }
 }
 
 } // namespace

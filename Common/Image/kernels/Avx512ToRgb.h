@@ -1,0 +1,203 @@
+// 4:2:0 to RGB with AVX-512.
+//
+// 64 pixels as bytes. They stand in an order in which unpacking within lanes of 128 bits gives 32-bit pixels
+// in memory order: byte 4 k + j of lane L is pixel 16 k + 4 L + j.
+#ifndef MOVIECONV_COMMON_IMAGE_KERNELS_AVX512TORGB_H
+#define MOVIECONV_COMMON_IMAGE_KERNELS_AVX512TORGB_H
+
+#include "Common/Image/kernels/Avx512Registers.h"
+
+namespace image {
+namespace {
+
+constexpr int PixelAt(int place) {
+    return place % 16 / 4 * 16 + place / 16 * 4 + place % 4;
+}
+constexpr int PlaceOf(int pixel) {
+    return pixel / 4 % 4 * 16 + pixel / 16 * 4 + pixel % 4;
+}
+
+/// The chroma terms of the pixels 0 to 7 of each lane, and of 8 to 15.
+struct Terms {
+    explicit Terms(__m512i words)
+        : low(_mm512_unpacklo_epi16(words, words)), high(_mm512_unpackhi_epi16(words, words)) {}
+    __m512i low, high;
+};
+
+__m512i Times(__m512i words, int factor) {
+    return _mm512_mullo_epi16(words, _mm512_set1_epi16(static_cast<int16_t>(factor)));
+}
+__m512i Plus(__m512i words, int constant) {
+    return _mm512_add_epi16(words, _mm512_set1_epi16(static_cast<int16_t>(constant)));
+}
+
+template <class Form>
+__m512i RedTerm(__m512i v) {
+    const __m512i rest =
+        _mm512_srai_epi16(Plus(Times(v, Form::kRedRest), Form::kRedRestConstant), Form::kShift);
+    return _mm512_add_epi16(Plus(Times(v, Form::kRedWhole), Form::kRedConstant), rest);
+}
+
+template <class Form>
+__m512i GreenTerm(__m512i u, __m512i v) {
+    const __m512i rests = _mm512_add_epi16(Times(u, Form::kGreenURest), Times(v, Form::kGreenVRest));
+    const __m512i wholes = _mm512_add_epi16(Times(u, Form::kGreenUWhole), Times(v, Form::kGreenVWhole));
+    return _mm512_add_epi16(Plus(wholes, Form::kGreenConstant),
+                            _mm512_srai_epi16(Plus(rests, Form::kGreenRestConstant), Form::kShift));
+}
+
+template <class Form>
+__m512i BlueRestTerm(__m512i u) {
+    const __m512i rest =
+        _mm512_srai_epi16(Plus(Times(u, Form::kBlueRest), Form::kBlueRestConstant), Form::kShift);
+    return _mm512_add_epi16(Plus(Times(u, Form::kBlueWhole), Form::kBlueConstant), rest);
+}
+
+/// All that 32 chroma samples give their pixels, from words of U and V.
+template <class Form>
+struct ChromaTerms {
+    ChromaTerms(__m512i u, __m512i v)
+        : red(RedTerm<Form>(v)),
+          green(GreenTerm<Form>(u, v)),
+          blue(_mm512_xor_si512(_mm512_slli_epi16(u, 8), _mm512_set1_epi16(-0x8000))),
+          blueRest(BlueRestTerm<Form>(u)) {}
+    Terms red, green, blue, blueRest;
+};
+
+/// Bytes of 64 pixels.
+struct Rgb {
+    __m512i blue, green, red;
+};
+
+__m512i Component(__m512i low, __m512i high) {
+    return _mm512_packus_epi16(_mm512_srai_epi16(low, 7), _mm512_srai_epi16(high, 7));
+}
+
+template <class Form>
+Rgb ToRgb(__m512i y, const ChromaTerms<Form>& terms) {
+    const __m512i centred = _mm512_xor_si512(y, _mm512_set1_epi8(-128));
+    const __m512i weights = BytePairs(Form::kLumaWeight, Form::kLumaConstant);
+    const __m512i constant = _mm512_set1_epi8(127);
+    const __m512i low = _mm512_maddubs_epi16(weights, _mm512_unpacklo_epi8(centred, constant));
+    const __m512i high = _mm512_maddubs_epi16(weights, _mm512_unpackhi_epi8(centred, constant));
+    const auto add = [&](const Terms& chroma) {
+        return Component(_mm512_adds_epi16(low, chroma.low), _mm512_adds_epi16(high, chroma.high));
+    };
+    const __m512i blueLow = _mm512_adds_epi16(_mm512_adds_epi16(low, terms.blue.low), terms.blueRest.low);
+    const __m512i blueHigh = _mm512_adds_epi16(_mm512_adds_epi16(high, terms.blue.high), terms.blueRest.high);
+    return {Component(blueLow, blueHigh), add(terms.green), add(terms.red)};
+}
+
+/// One of the three parts of 64 pixels of three bytes.
+template <int kThird>
+struct Bgr24Third {
+    static constexpr Table kPlaces = MakeTable([](int i) { return PlaceOf((64 * kThird + i) / 3); });
+    static constexpr uint64_t BytesOf(int component) {
+        uint64_t mask = 0;
+        for (int i = 0; i < 64; ++i)
+            mask |= uint64_t{(64 * kThird + i) % 3 == component} << i;
+        return mask;
+    }
+
+    __m512i operator()(const Rgb& rgb) const {
+        const __m512i blue = _mm512_permutexvar_epi8(places_, rgb.blue);
+        const __m512i blueGreen = _mm512_mask_permutexvar_epi8(blue, BytesOf(1), places_, rgb.green);
+        return _mm512_mask_permutexvar_epi8(blueGreen, BytesOf(2), places_, rgb.red);
+    }
+
+private:
+    __m512i places_ = kPlaces.Load();
+};
+
+template <class Memory>
+class Bgr24Target {
+public:
+    template <class Columns>
+    void operator()(Columns columns, uint8_t* row, ptrdiff_t x, const Rgb& rgb) const {
+        uint8_t* const target = row + 3 * x;
+        const ptrdiff_t bytes = 3 * columns.count;
+        Store<Memory>(columns, target, bytes, first_(rgb));
+        Store<Memory>(columns, target + 64, bytes - 64, second_(rgb));
+        Store<Memory>(columns, target + 128, bytes - 128, third_(rgb));
+    }
+
+private:
+    Bgr24Third<0> first_;
+    Bgr24Third<1> second_;
+    Bgr24Third<2> third_;
+};
+
+/// Pixels of four bytes; the fourth becomes 255, or is not stored at all.
+template <class Memory, bool kOpaque>
+class Bgr32Target {
+public:
+    template <class Columns>
+    void operator()(Columns columns, uint8_t* row, ptrdiff_t x, const Rgb& rgb) const {
+        const __m512i fourth = _mm512_set1_epi8(-1);
+        const __m512i blueGreen[2] = {_mm512_unpacklo_epi8(rgb.blue, rgb.green),
+                                      _mm512_unpackhi_epi8(rgb.blue, rgb.green)};
+        const __m512i redFourth[2] = {_mm512_unpacklo_epi8(rgb.red, fourth),
+                                      _mm512_unpackhi_epi8(rgb.red, fourth)};
+        for (int half = 0; half < 2; ++half) {
+            const ptrdiff_t skipped = 128 * half;
+            uint8_t* const target = row + 4 * x + skipped;
+            const ptrdiff_t bytes = 4 * columns.count - skipped;
+            StorePixels(columns, target, bytes, _mm512_unpacklo_epi16(blueGreen[half], redFourth[half]));
+            StorePixels(columns, target + 64, bytes - 64,
+                        _mm512_unpackhi_epi16(blueGreen[half], redFourth[half]));
+        }
+    }
+
+private:
+    template <class Columns>
+    static void StorePixels(Columns columns, uint8_t* target, ptrdiff_t bytes, __m512i pixels) {
+        constexpr uint64_t kColours = 0x7777777777777777;
+        if constexpr (kOpaque)
+            Store<Memory>(columns, target, bytes, pixels);
+        else if constexpr (Columns::kMasked)
+            _mm512_mask_storeu_epi8(target, Bits(bytes) & kColours, pixels);
+        else
+            _mm512_mask_storeu_epi8(target, kColours, pixels);
+    }
+};
+
+/// Chroma bytes as words, in the order of the pixels.
+class ChromaWords {
+public:
+    template <class Columns>
+    __m512i operator()(Columns columns, const uint8_t* row, ptrdiff_t x) const {
+        const __m256i bytes = LoadHalf(columns, row + x / 2, (columns.count + 1) / 2);
+        return _mm512_maskz_permutexvar_epi8(~kOddBytes, places_, _mm512_castsi256_si512(bytes));
+    }
+
+private:
+    static constexpr Table kPlaces = MakeTable([](int i) { return PixelAt(i) / 2; });
+    __m512i places_ = kPlaces.Load();
+};
+
+template <class Memory, class Target, class Form, From420 RowKernels::*kKernel>
+void RgbFrom420(Rows rgb, Planes420 source, Size size) {
+    if (IsNarrow<kStep>(size))
+        return (kAvx2Kernels.*kKernel)(rgb, source, size);
+    // Groups of four pixels, as 32-bit places.
+    static constexpr Table kLuma = MakeTable([](int i) { return i % 4 == 0 ? PixelAt(i) / 4 : 0; });
+    const ChromaWords words;
+    const Target store;
+    const __m512i order = kLuma.Load();
+    ForRowPairs(source, rgb, size.height, [&](PlanesPair from, RowPair to, ptrdiff_t, ptrdiff_t) {
+        ForSteps<kStep>(size.width, [&](ptrdiff_t x, auto columns) {
+            const ChromaTerms<Form> terms(words(columns, from.u, x), words(columns, from.v, x));
+            const auto luma = [&](const uint8_t* row) {
+                return _mm512_permutexvar_epi32(order, Load(columns, row + x, columns.count));
+            };
+            store(columns, to.first, x, ToRgb<Form>(luma(from.y.first), terms));
+            store(columns, to.second, x, ToRgb<Form>(luma(from.y.second), terms));
+        });
+    });
+    Memory::Finish();
+}
+
+} // namespace
+} // namespace image
+
+#endif
