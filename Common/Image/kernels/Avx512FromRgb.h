@@ -141,7 +141,7 @@ private:
     __m512i places_;
 };
 
-constexpr int kRgbStep = 32;
+inline constexpr int kRgbStep = 32;
 
 /// Writes 4:2:0 from two rows of pixels that `Read` knows how to read.
 template <class Form, class Read>
@@ -199,7 +199,7 @@ void StoreAlpha(Columns columns, uint8_t* alpha, const uint8_t* bgra, ptrdiff_t 
         gather(Load(columns, source, 4 * columns.count), Load(columns, source + 64, 4 * columns.count - 64)));
 }
 
-void Bgra32To420(Planes420 target, Rows alpha, Rows bgra, Size size) {
+inline void Bgra32To420(Planes420 target, Rows alpha, Rows bgra, Size size) {
     if (IsNarrow<kRgbStep>(size))
         return kAvx2Kernels.bgra32To420(target, alpha, bgra, size);
     const To420Step<FastRgbForm, Bgr32> convert;

@@ -41,14 +41,14 @@ void ForSteps(ptrdiff_t width, Step step) {
         step(x, Part{width - x});
 }
 
-uint64_t Bits(ptrdiff_t count) {
+inline uint64_t Bits(ptrdiff_t count) {
     if (count >= 64)
         return ~uint64_t{0};
     return count <= 0 ? 0 : (uint64_t{1} << count) - 1;
 }
 
 /// Columns of most steps, each a byte of a register.
-constexpr int kStep = 64;
+inline constexpr int kStep = 64;
 
 /// The bytes at `source`, as far as there are any; zeroes behind them.
 template <class Columns>
@@ -115,7 +115,7 @@ void StoreQuarter(Columns, uint8_t* target, ptrdiff_t bytes, __m128i value) {
 }
 
 /// Asks for what the steps a little further on will read; past the end of a row it does no harm.
-void Prefetch(const uint8_t* source) {
+inline void Prefetch(const uint8_t* source) {
     constexpr int kAhead = 2048;
     _mm_prefetch(reinterpret_cast<const char*>(source + kAhead), _MM_HINT_T0);
 }
@@ -137,7 +137,7 @@ struct alignas(64) Table {
 
 /// The bytes of two registers at the given places, by a permutation of each: the one of two registers at once
 /// takes three operations on some processors.
-__m512i PermutePair(__m512i first, __m512i second, __m512i places, uint64_t fromSecond) {
+inline __m512i PermutePair(__m512i first, __m512i second, __m512i places, uint64_t fromSecond) {
     return _mm512_mask_permutexvar_epi8(_mm512_permutexvar_epi8(places, first), fromSecond, places, second);
 }
 
@@ -151,14 +151,14 @@ constexpr Table MakeTable(Entry entry) {
 }
 
 /// Two words, or four bytes, that fill every lane of 32 bits.
-__m512i Words(int low, int high) {
+inline __m512i Words(int low, int high) {
     return _mm512_set1_epi32(static_cast<int>((static_cast<uint32_t>(high) << 16) | (low & 0xFFFF)));
 }
-__m512i BytePairs(int low, int high) {
+inline __m512i BytePairs(int low, int high) {
     return _mm512_set1_epi16(static_cast<int16_t>(high * 256 + (low & 0xFF)));
 }
 
-constexpr uint64_t kOddBytes = 0xAAAAAAAAAAAAAAAA;
+inline constexpr uint64_t kOddBytes = 0xAAAAAAAAAAAAAAAA;
 
 /// Where the samples of pixel p stand in a packed row.
 template <PackedOrder kOrder>

@@ -24,10 +24,10 @@ struct Terms {
     __m512i low, high;
 };
 
-__m512i Times(__m512i words, int factor) {
+inline __m512i Times(__m512i words, int factor) {
     return _mm512_mullo_epi16(words, _mm512_set1_epi16(static_cast<int16_t>(factor)));
 }
-__m512i Plus(__m512i words, int constant) {
+inline __m512i Plus(__m512i words, int constant) {
     return _mm512_add_epi16(words, _mm512_set1_epi16(static_cast<int16_t>(constant)));
 }
 
@@ -69,7 +69,7 @@ struct Rgb {
     __m512i blue, green, red;
 };
 
-__m512i Component(__m512i low, __m512i high) {
+inline __m512i Component(__m512i low, __m512i high) {
     return _mm512_packus_epi16(_mm512_srai_epi16(low, 7), _mm512_srai_epi16(high, 7));
 }
 
