@@ -9,11 +9,11 @@ namespace {
 
 constexpr std::size_t kPicturesAhead = 4;
 constexpr std::size_t kBytesAhead = 256 << 20;
-constexpr int kTrialPictures = 40;
-constexpr int kWarmUpPictures = 16;
+constexpr int kTrialPictures = 16;
+constexpr int kWarmUpPictures = 12;
 constexpr std::size_t kTrialPackets = 400;
 constexpr unsigned kMostThreads = 16;
-constexpr double kBusy = 0.85; // share of the processors from which more threads bring nothing
+constexpr double kBusy = 0.75; // share of the processors from which more threads bring nothing
 
 std::size_t Bytes(const AVFrame& frame) {
     return static_cast<std::size_t>(frame.width) * static_cast<std::size_t>(frame.height) * 3 / 2;

@@ -56,7 +56,7 @@ ptrdiff_t EvenAbove(ptrdiff_t x) {
 const RowKernels& KernelsFor(const Picture& target) {
     constexpr int64_t kLargeBytes = 8'000'000;
     const RowKernels& kernels = BestRowKernels();
-    const bool large = target.Bytes() >= kLargeBytes && kernels.large != nullptr &&
+    const bool large = target.Bytes() >= kLargeBytes && kernels.large != nullptr && WritingPastCachesPays() &&
                        target.size.width % kLargeWidthStep == 0 && target.rows.AlignedTo(kLargeAlignment);
     return large ? *kernels.large : kernels;
 }

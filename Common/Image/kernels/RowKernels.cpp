@@ -49,6 +49,14 @@ const RowKernels& BestRowKernels() {
     return *kernels;
 }
 
+bool WritingPastCachesPays() {
+#ifdef MOVIECONV_X86_KERNELS
+    return __builtin_cpu_is("amd");
+#else
+    return false;
+#endif
+}
+
 void ForceRowKernels(KernelLevel level) {
     g_kernels.store(RowKernelsFor(level), std::memory_order_relaxed);
 }

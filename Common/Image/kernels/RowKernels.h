@@ -77,6 +77,12 @@ const RowKernels* RowKernelsFor(KernelLevel level);
 /// The kernels of the highest level there is, chosen once, or of the level that was forced.
 const RowKernels& BestRowKernels();
 
+/// Whether writing past the caches pays for large targets. With AMD's processors it does, also when the
+/// result is read at once. Intel's keep a whole picture in their last cache: there a converted picture of
+/// 1920x1080 or more takes nearly twice as long until it has been read once, because it comes back from
+/// memory.
+bool WritingPastCachesPays();
+
 /// Makes every later call of a routine use one level, so that tests and benchmarks can compare levels. A
 /// level that the processor lacks gives the choice back.
 void ForceRowKernels(KernelLevel level);
