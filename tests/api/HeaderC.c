@@ -1,5 +1,6 @@
 // The interface as a C program uses it.
 #include "api/MovieConv.h"
+#include "media/MediaWriter.h"
 
 static unsigned Callback(void* context, unsigned kind, unsigned value, uintptr_t info) {
     const ProgressInfo* progress = (const ProgressInfo*)info;
@@ -7,8 +8,16 @@ static unsigned Callback(void* context, unsigned kind, unsigned value, uintptr_t
     return 1;
 }
 
+// The sizes that the headers promise to C++.
+static int SizesDiffer(void) {
+    const size_t widened = sizeof(void*) - 4;
+    return sizeof(VideoFormat) != 24 || sizeof(AudioFormat) != 24 || sizeof(VideoImage) != 76 + 3 * widened ||
+           sizeof(AudioFrame) != 76 + widened || sizeof(EncodeParam) != 104 || sizeof(FileFormatInfo) != 828;
+}
+
 int main(void) {
     EncodeParam param = {0};
+    EventRef event = NULL;
     double position = 0.0;
     wchar_t name[MC_MAX_TARGET_NAME];
     param.nAudioBitrate = 128000;
@@ -16,5 +25,8 @@ int main(void) {
         return 1;
     if (MCCreate(NULL, NULL) || MCStart(NULL, 0.0, 0.0, NULL, Callback, &position) != -1)
         return 2;
-    return MCGetTargetFileName(NULL, name, 0);
+    if (CreateEvent(NULL, 5000, 42, 0.0, 0, &event) != noErr || GetEventKind(event) != 42)
+        return 3;
+    ReleaseEvent(event);
+    return SizesDiffer() || MCGetTargetFileName(NULL, name, 0);
 }

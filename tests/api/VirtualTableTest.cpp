@@ -138,39 +138,9 @@ TEST_F(VirtualTableTest, ConvertsThroughTheListedSlots) {
     EXPECT_EQ(trace, expected);
 }
 
-TEST_F(VirtualTableTest, HelpersUseTheSameSlots) {
-    get_small_frame(nullptr);
-    const AudioFrame* frame = get_small_frame(Audio());
-    ASSERT_NE(frame, nullptr);
-    EXPECT_EQ(frame->nLength, 30);
-    get_small_frame(nullptr);
-    EXPECT_EQ(PlayAudio(Audio()), &audio.info);
-}
-
-// The news also arrives where a host's main thread receives its events.
-TEST_F(VirtualTableTest, EventsReachTheMainQueue) {
-    EventRef event = nullptr;
-    while (ReceiveNextEvent(0, nullptr, 0.0, 1, &event) == noErr) // what other tests have posted
-        ReleaseEvent(event);
-    const MCHandle handle = MCCreate(nullptr, Audio());
-    auto* window = reinterpret_cast<OpaqueWindowPtr*>(uintptr_t{0xABCD1234});
-    MCStart(handle, 0.0, 0.0, window, nullptr, nullptr);
-    MCWait(handle, MC_INFINITE);
-    MCDestroy(handle);
-    const EventTypeSpec type = {5000, 0x6B696E64};
-    const UInt32 expected[][3] = {{0, 10000, 0xABCD1234}, {100, 0, 0xABCD1234}};
-    for (const auto& values : expected) {
-        ASSERT_EQ(ReceiveNextEvent(1, &type, 0.0, 1, &event), noErr);
-        const EventParamName names[] = {0x5750414D, 0x4C50414D, 0x48574E44};
-        for (int i = 0; i < 3; ++i) {
-            UInt32 value = 1;
-            EXPECT_EQ(GetEventParameter(event, names[i], 0x55494E54, nullptr, sizeof value, nullptr, &value),
-                      noErr);
-            EXPECT_EQ(value, values[i]);
-        }
-        ReleaseEvent(event);
-    }
-    EXPECT_EQ(ReceiveNextEvent(1, &type, 0.0, 1, &event), eventLoopTimedOutErr);
+TEST(FourCCTest, StandsInMemoryAsItIsRead) {
+    EXPECT_EQ(FourCC("MP4 "), 0x2034504DU);
+    EXPECT_EQ(FourCC("\xFF\x80\x01\x7F"), 0x7F0180FFU);
 }
 
 TEST(NullTest, NullHandlesDoNothing) {

@@ -10,8 +10,6 @@
 #include <thread>
 #include <vector>
 
-extern "C" OSStatus PostFromC(OSType eventClass, UInt32 eventKind);
-
 namespace {
 
 constexpr OSType kClass = 5000;
@@ -180,11 +178,6 @@ TEST_F(EventQueue, RefusesMoreThanItHolds) {
     EXPECT_EQ(Post(event), noErr);
     EXPECT_EQ(Post(event), eventAlreadyPostedErr);
     ReleaseEvent(event);
-}
-
-TEST_F(EventQueue, IsUsableFromC) {
-    EXPECT_EQ(PostFromC(kClass, 42), noErr);
-    EXPECT_EQ(NextKind(), 42);
 }
 
 TEST_F(EventQueue, WaitsNoLongerThanAsked) {
