@@ -408,7 +408,6 @@ void FuzzConversion(FuzzedDataProvider& input) {
 
     for (int round = input.ConsumeIntegralInRange(1, 2); round > 0; --round) {
         recorder::Reset();
-        recorder::SkipDigests();
         video.Rewind();
         audio.Rewind();
         const int split = input.ConsumeIntegralInRange(0, 2);

@@ -152,9 +152,31 @@ ScriptedHost::ScriptedHost() {
     SetClock(0xFFFFFF00); // so that every longer test crosses the wrap
 }
 
+void ScriptedHost::SetMovie(size_t pictures, size_t blocks) {
+    video.stamps = Stamps(0, kSecond / 10, pictures);
+    audio.stamps = Stamps(0, kSecond / 20, blocks);
+    video.Format().dDuration = static_cast<double>(pictures) / 10;
+    audio.Format().dDuration = static_cast<double>(blocks) / 20;
+}
+
 void ScriptedHost::Create() {
     handle = MCCreate(hasVideo ? &video : nullptr, hasAudio ? &audio : nullptr);
     MCSetOutputFile(handle, L"out.mp4");
+}
+
+void ScriptedHost::Change(const std::function<void(EncodeParam&)>& change) {
+    if (!handle)
+        Create();
+    EncodeParam param;
+    MCGetEncodeParam(handle, &param);
+    change(param);
+    MCSetEncodeParam(handle, &param);
+}
+
+void ScriptedHost::Split(unsigned long milliseconds) {
+    if (!handle)
+        Create();
+    MCSetSplitParam(handle, 1, milliseconds);
 }
 
 int ScriptedHost::Start(double begin, double length) {
@@ -174,21 +196,39 @@ unsigned ScriptedHost::Callback(void* context, unsigned kind, unsigned value, ui
                                                            reinterpret_cast<const ProgressInfo*>(info));
 }
 
+namespace {
+
+std::string Figure(const char* name, double value) {
+    char text[64];
+    snprintf(text, sizeof text, " %s %g", name, value);
+    return text;
+}
+
+/// A record without what is as usual.
+std::string Describe(const ProgressInfo* info) {
+    if (!info)
+        return " without record";
+    std::string text = Figure("at", info->dPosition);
+    if (std::abs(info->dDoneLength - info->dPosition) > 1e-9)
+        text += Figure("done", info->dDoneLength);
+    if (info->dSpeed != 0.0)
+        text += Figure("speed", info->dSpeed);
+    if (info->nPercent != info->nProgress / 100)
+        text += Figure("percent", info->nPercent);
+    if (info->pPreviewImage)
+        text += " preview " + std::to_string(info->pPreviewImage->llTime);
+    return text;
+}
+
+} // namespace
+
 unsigned ScriptedHost::OnCallback(unsigned kind, unsigned value, const ProgressInfo* info) {
     if (info && kind == 0)
         records.push_back(*info);
-    std::string line = (kind == 1 ? "finished " : "progress ") + std::to_string(static_cast<int>(value));
-    char text[64] = " without record";
-    if (info)
-        snprintf(text, sizeof text, " at %g", info->dPosition);
-    line += text;
-    if (info && std::abs(info->dDoneLength - info->dPosition) > 1e-9) {
-        snprintf(text, sizeof text, " done %g", info->dDoneLength);
-        line += text;
-    }
-    if (info && info->pPreviewImage)
-        line += " preview " + std::to_string(info->pPreviewImage->llTime);
-    recorder::Note(line);
+    const std::string name = kind == 1 ? "finished " : "progress ";
+    const bool usual = kind == 1 || !info || info->nProgress == static_cast<int>(value);
+    recorder::Note(name + std::to_string(static_cast<int>(value)) + Describe(info) +
+                   (usual ? "" : " unusual"));
     if (onCallback)
         onCallback(kind, info);
     return kind == 0 && ++progressCalls == cancelAt ? 0 : 1;
@@ -211,4 +251,10 @@ std::string LogLines() {
 }
 std::string TraceWithoutLog() {
     return Filter(false);
+}
+std::string WholeTrace() {
+    std::string lines;
+    for (const std::string& line : recorder::Trace())
+        lines += line + "\n";
+    return lines;
 }

@@ -86,9 +86,10 @@ private:
 std::vector<int64_t> Stamps(int64_t first, int64_t step, size_t count);
 
 /// A converter over scripted decoders. Notes the callbacks:
-///     progress VALUE at POSITION [done LENGTH] [preview STAMP]      "done" where it is not the position
-///     finished OUTCOME at POSITION [done LENGTH], or finished OUTCOME without record
-/// and the events:
+///     progress VALUE at POSITION [done LENGTH] [speed SPEED] [preview STAMP]
+///     finished OUTCOME at POSITION [done LENGTH] [speed SPEED], or finished OUTCOME without record
+/// with "done" where it is not the position, "speed" where it is not 0 and "unusual" behind a value that is
+/// not the record's. Notes the events:
 ///     event progress VALUE, event finished OUTCOME
 class ScriptedHost {
 public:
@@ -97,8 +98,17 @@ public:
     ScriptedHost(const ScriptedHost&) = delete;
     ScriptedHost& operator=(const ScriptedHost&) = delete;
 
+    /// As many pictures and blocks, 10 and 20 a second, each stream as long as that makes it.
+    void SetMovie(size_t pictures, size_t blocks);
+
     /// Makes the converter over the decoders that are wanted, with the output "out.mp4".
     void Create();
+
+    /// Creates the converter unless it exists, and changes its parameters.
+    void Change(const std::function<void(EncodeParam&)>& change);
+
+    /// Creates the converter unless it exists, and splits the output into clips of that length.
+    void Split(unsigned long milliseconds);
 
     /// Creates the converter unless it exists, and starts it with the callback.
     int Start(double begin = 0.0, double length = 0.0);
@@ -126,8 +136,9 @@ private:
     unsigned progressCalls = 0;
 };
 
-/// The log lines of the trace, or everything else, a line each.
+/// The log lines of the trace, everything else, or all of it, a line each.
 std::string LogLines();
 std::string TraceWithoutLog();
+std::string WholeTrace();
 
 #endif

@@ -1,5 +1,6 @@
 // The three loops run while other threads pause, resume, query, toggle the preview and abort. What matters is
 // that nothing hangs and that the thread sanitizer stays silent.
+#include "tests/engine/IdleParts.h"
 #include "tests/engine/ScriptedHost.h"
 
 #include <gtest/gtest.h>
@@ -8,58 +9,24 @@
 
 namespace {
 
-class BusyVideo : public VideoDecoder {
-public:
-    explicit BusyVideo(double duration) { info.format = {320, 240, 25.0, duration}; }
-    VideoSourceInfo* GetVideoInfo() override { return &info; }
-    double Seek(double, int) override { return 0.0; }
-    VideoImage* GetCurrentImage() override { return &image; }
-    int DecodeNext(int) override {
-        image.llTime += kSecond / 25;
-        return 1;
-    }
-
-private:
-    VideoSourceInfo info{};
-    VideoImage image{};
-};
-
-class BusyAudio : public AudioDecoder {
-public:
-    explicit BusyAudio(double duration) {
-        info.format = {8000, 1, 8, 8000, duration};
-        block.nLength = 80;
-        block.pData = samples;
-    }
-    AudioSourceInfo* GetAudioInfo() override { return &info; }
-    double Seek(double) override { return 0.0; }
-    AudioFrame* GetNextFrame() override {
-        block.llTime += kSecond / 100;
-        return &block;
-    }
-
-private:
-    AudioSourceInfo info{};
-    AudioFrame block{};
-    unsigned char samples[80] = {};
-};
-
 unsigned ReadRecord(void*, unsigned, unsigned, uintptr_t info) {
     if (const auto* record = reinterpret_cast<const ProgressInfo*>(info))
         return record->nProgress >= 0;
     return 1;
 }
 
+constexpr int64_t kEndless = 1'000'000'000;
+
 struct Loop {
     const char* name;
-    double videoDuration, audioDuration;
+    int64_t pictures, blocks;
 };
 
 class StressTest : public testing::TestWithParam<Loop> {};
 
 TEST_P(StressTest, EverythingAtOnce) {
-    BusyVideo video(GetParam().videoDuration);
-    BusyAudio audio(GetParam().audioDuration);
+    IdleVideo video(GetParam().pictures);
+    IdleAudio audio(GetParam().blocks);
     recorder::Reset();
     const MCHandle handle = MCCreate(&video, &audio);
     MCSetOutputFile(handle, L"out.mp4");
@@ -112,13 +79,13 @@ TEST_P(StressTest, EverythingAtOnce) {
 }
 
 INSTANTIATE_TEST_SUITE_P(Loops, StressTest,
-                         testing::Values(Loop{"AudioVideo", 3600.0, 3600.0}, Loop{"Audio", 0.0, 3600.0},
-                                         Loop{"Video", 3600.0, 0.0}),
+                         testing::Values(Loop{"AudioVideo", kEndless, kEndless}, Loop{"Audio", 0, kEndless},
+                                         Loop{"Video", kEndless, 0}),
                          [](const auto& info) { return info.param.name; });
 
 // Stops of several threads run one after the other, and all return.
 TEST(StopTest, SeveralThreadsStop) {
-    BusyVideo video(3600.0);
+    IdleVideo video(kEndless);
     recorder::Reset();
     const MCHandle handle = MCCreate(&video, nullptr);
     for (int round = 0; round < 10; ++round) {

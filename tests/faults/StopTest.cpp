@@ -51,6 +51,7 @@ private:
 Gate g_picture;
 Gate g_sound;
 Gate g_callback;
+Gate g_write;
 Gate g_close;
 
 class GatedVideo : public IdleVideo {
@@ -72,6 +73,11 @@ public:
 };
 
 void Nothing() {}
+
+void PauseTwice(MCHandle handle) {
+    MCPause(handle);
+    MCPause(handle);
+}
 
 struct State {
     const char* name;
@@ -95,20 +101,20 @@ std::vector<State> States() {
     State inTheClose = HeldBy<g_close>("InTheClose");
     inTheClose.pictures = 100;
     inTheClose.outcome = kOutcomeCompleted;
-    return {
-        {"Running", Nothing, [](MCHandle) {}, Nothing},
-        {"Paused", Nothing, [](MCHandle handle) { MCPause(handle); }, Nothing},
-        {"InTheWriter", recorder::Block, [](MCHandle) { recorder::WaitUntilBlocked(); }, recorder::Unblock},
-        HeldBy<g_picture>("InThePictureDecoder"),
-        HeldBy<g_sound>("InTheSoundDecoder"),
-        HeldBy<g_callback>("InTheCallback"),
-        inTheClose};
+    return {{"Running", Nothing, [](MCHandle) {}, Nothing},
+            {"PausedTwice", Nothing, PauseTwice, Nothing},
+            HeldBy<g_write>("InTheWriter"),
+            HeldBy<g_picture>("InThePictureDecoder"),
+            HeldBy<g_sound>("InTheSoundDecoder"),
+            HeldBy<g_callback>("InTheCallback"),
+            inTheClose};
 }
 
 class StopFrom : public testing::TestWithParam<State> {
 protected:
     StopFrom() {
         recorder::Reset();
+        recorder::OnWrite([] { g_write.Pass(); });
         recorder::OnClose([] { g_close.Pass(); });
     }
     ~StopFrom() override {
@@ -164,11 +170,16 @@ TEST_P(StopFrom, ComesBack) {
 TEST_P(StopFrom, AbortDoesNotWait) {
     StartAndEnter();
     EXPECT_EQ(MCAbort(handle_), 1);
+    EXPECT_EQ(MCPause(handle_), 0) << "a stop has been asked for";
     if (IsHeld()) {
         EXPECT_EQ(MCWait(handle_, 0), MC_WAIT_TIMEOUT) << "the worker is held";
+        EXPECT_EQ(MCSetSplitParam(handle_, 1, 1000), 0);
+        EXPECT_EQ(MCStart(handle_, 0.0, 0.0, nullptr, nullptr, nullptr), 0) << "and changes nothing";
     }
     GetParam().release();
     EXPECT_EQ(MCWait(handle_, MC_INFINITE), 0);
+    EXPECT_EQ(MCAbort(handle_), 0);
+    EXPECT_EQ(MCSetSplitParam(handle_, 1, 1000), 1);
     EXPECT_EQ(outcome_, GetParam().outcome);
 }
 

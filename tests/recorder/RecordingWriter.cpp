@@ -2,7 +2,7 @@
 
 #include "media/MediaWriter.h"
 
-#include <condition_variable>
+#include <algorithm>
 #include <cstdio>
 #include <mutex>
 
@@ -15,53 +15,26 @@ struct State {
     std::vector<EncodeParam> params;
     std::set<int> failing;
     const FileFormatInfo* formats = nullptr;
+    std::function<void()> onWrite;
     std::function<void()> onClose;
-    bool digesting = true;
-    bool blocking = false;
-    bool blocked = false;
 };
 
 std::mutex g_mutex;
-std::condition_variable g_changed;
 State g_state;
 
-constexpr uint32_t kDigestStart = 2166136261;
-
-uint32_t AddToDigest(uint32_t digest, const unsigned char* data, size_t length) {
-    for (size_t i = 0; i < length; ++i)
-        digest = (digest ^ data[i]) * 16777619; // FNV-1a
-    return digest;
+/// Whether a block is the engine's silence. Of a long one only the first 64 KiB are looked at.
+bool IsSilence(const AudioFrame& frame) {
+    return frame.nType == kMediaTypeSilence &&
+           std::all_of(frame.pData, frame.pData + std::clamp(frame.nLength, 0, 1 << 16),
+                       [](unsigned char byte) { return byte == 0; });
 }
 
-uint32_t AddPlane(uint32_t digest, const unsigned char* plane, int32_t pitch, int32_t width, int32_t height) {
-    for (int32_t y = 0; plane && y < height; ++y)
-        digest = AddToDigest(digest, plane + static_cast<ptrdiff_t>(y) * pitch, static_cast<size_t>(width));
-    return digest;
-}
-
-uint32_t DigestOf(const AudioFrame& frame) {
-    return recorder::Digest(frame.pData,
-                            frame.pData && frame.nLength > 0 ? static_cast<size_t>(frame.nLength) : 0);
-}
-
-uint32_t DigestOf(const VideoImage& image) {
-    const int32_t halfWidth = image.nWidth / 2 + image.nWidth % 2;
-    const int32_t halfHeight = image.nHeight / 2 + image.nHeight % 2;
-    uint32_t digest = AddPlane(kDigestStart, image.pY, image.nPitchY, image.nWidth, image.nHeight);
-    digest = AddPlane(digest, image.pU, image.nPitchU, halfWidth, halfHeight);
-    return AddPlane(digest, image.pV, image.nPitchV, halfWidth, halfHeight);
-}
-
-/// The text with everything but ASCII as \u{CODE}.
+/// The text with "?" for everything but ASCII.
 std::string Ascii(const wchar_t* text) {
-    std::string bytes;
-    for (; *text; ++text) {
-        char character[16];
-        const bool ascii = *text > 0 && *text < 0x80;
-        snprintf(character, sizeof character, ascii ? "%c" : "\\u{%X}", static_cast<unsigned>(*text));
-        bytes += character;
-    }
-    return bytes;
+    std::string ascii;
+    for (; *text; ++text)
+        ascii += *text > 0 && *text < 0x80 ? static_cast<char>(*text) : '?';
+    return ascii;
 }
 
 template <class... Values>
@@ -80,27 +53,22 @@ int Number(const void* file) {
     return file ? static_cast<const File*>(file)->number : 0;
 }
 
-void WaitWhileBlocking(std::unique_lock<std::mutex>& guard) {
-    if (!g_state.blocking)
-        return;
-    g_state.blocked = true;
-    g_changed.notify_all();
-    g_changed.wait(guard, [] { return !g_state.blocking; });
-    g_state.blocked = false;
+/// Calls a hook with nothing locked, since it may take its time.
+void Call(std::function<void()> State::*member) {
+    std::unique_lock guard(g_mutex);
+    const std::function<void()> hook = g_state.*member;
+    guard.unlock();
+    if (hook)
+        hook();
 }
 
 } // namespace
 
 namespace recorder {
 
-uint32_t Digest(const unsigned char* data, size_t length) {
-    return AddToDigest(kDigestStart, data, length);
-}
-
 void Reset() {
     const std::lock_guard guard(g_mutex);
     g_state = State();
-    g_changed.notify_all();
 }
 
 void Note(std::string_view line) {
@@ -128,11 +96,6 @@ std::vector<EncodeParam> Params() {
     return g_state.params;
 }
 
-void SkipDigests() {
-    const std::lock_guard guard(g_mutex);
-    g_state.digesting = false;
-}
-
 void FailCreates(std::set<int> numbers) {
     const std::lock_guard guard(g_mutex);
     g_state.failing = std::move(numbers);
@@ -143,25 +106,14 @@ void SetFormatTable(const FileFormatInfo* table) {
     g_state.formats = table;
 }
 
+void OnWrite(std::function<void()> hook) {
+    const std::lock_guard guard(g_mutex);
+    g_state.onWrite = std::move(hook);
+}
+
 void OnClose(std::function<void()> hook) {
     const std::lock_guard guard(g_mutex);
     g_state.onClose = std::move(hook);
-}
-
-void Block() {
-    const std::lock_guard guard(g_mutex);
-    g_state.blocking = true;
-}
-
-void Unblock() {
-    const std::lock_guard guard(g_mutex);
-    g_state.blocking = false;
-    g_changed.notify_all();
-}
-
-void WaitUntilBlocked() {
-    std::unique_lock guard(g_mutex);
-    g_changed.wait(guard, [] { return g_state.blocked; });
 }
 
 } // namespace recorder
@@ -185,31 +137,25 @@ void* MWCreateMediaFile(const wchar_t* fileName, const EncodeParam* param, const
 }
 
 int MWWriteVideoFrame(void* file, const VideoImage* image) {
-    std::unique_lock guard(g_mutex);
-    WaitWhileBlocking(guard);
-    g_state.pictures.push_back({Number(file), *image, g_state.digesting ? DigestOf(*image) : 0});
+    Call(&State::onWrite);
+    const std::lock_guard guard(g_mutex);
+    g_state.pictures.push_back({Number(file), *image});
     g_state.trace.push_back(Format("picture #%d %lld", Number(file), static_cast<long long>(image->llTime)));
     return file != nullptr;
 }
 
 int MWWriteAudioData(void* file, const AudioFrame* frame) {
-    std::unique_lock guard(g_mutex);
-    WaitWhileBlocking(guard);
-    g_state.sounds.push_back({Number(file), *frame, g_state.digesting ? DigestOf(*frame) : 0});
-    g_state.trace.push_back(Format("%s #%d %lld +%d", frame->nType == kMediaTypeSilence ? "silence" : "sound",
-                                   Number(file), static_cast<long long>(frame->llTime), frame->nLength));
+    Call(&State::onWrite);
+    const std::lock_guard guard(g_mutex);
+    g_state.sounds.push_back({Number(file), *frame});
+    g_state.trace.push_back(Format("%s #%d %lld +%d", IsSilence(*frame) ? "silence" : "sound", Number(file),
+                                   static_cast<long long>(frame->llTime), frame->nLength));
     return file != nullptr;
 }
 
 int MWCloseMediaFile(void* file, ProgressCallback callback, void* context) {
-    std::function<void()> hook;
-    {
-        const std::lock_guard guard(g_mutex);
-        if (callback)
-            hook = g_state.onClose;
-    }
-    if (hook)
-        hook();
+    if (callback)
+        Call(&State::onClose);
     std::string line = Format("close #%d", Number(file));
     if (callback)
         line += context ? " with callback and context" : " with callback";

@@ -22,17 +22,12 @@
 
 namespace recorder {
 
-/// One record that reached the writer. `digest` is of the bytes that it points to: the sound, or the planes'
-/// rows.
+/// One record that reached the writer.
 template <class Record>
 struct Written {
     int file; // number of the file since Reset, from 1; 0 for a null handle
     Record record;
-    uint32_t digest;
 };
-
-/// A digest as the records carry it.
-uint32_t Digest(const unsigned char* data, size_t length);
 
 /// Forgets all recordings and everything that was set below.
 void Reset();
@@ -43,7 +38,7 @@ void Note(std::string_view line);
 /// The trace since Reset:
 ///
 ///     create NAME WxH@RATE RATE/CHANNELS -> #FILE     formats that are null are "-", a failure is "-> null"
-///     sound #FILE STAMP +BYTES                        "silence" for the engine's own
+///     sound #FILE STAMP +BYTES                        "silence" for the engine's own, which is all zeros
 ///     picture #FILE STAMP
 ///     close #FILE, or close #FILE with callback
 std::vector<std::string> Trace();
@@ -55,22 +50,15 @@ std::vector<Written<VideoImage>> Pictures();
 /// The parameters of the creates since Reset.
 std::vector<EncodeParam> Params();
 
-/// Leaves the digests of later writes 0, for long recordings.
-void SkipDigests();
-
 /// Makes the creates with these numbers, from 1, fail.
 void FailCreates(std::set<int> numbers);
 
 /// What MWGetFileFormatInfos gives out; null at first. The table stays the caller's.
 void SetFormatTable(const FileFormatInfo* table);
 
-/// Called in every final close, one with a callback, before it is noted.
+/// Called in every write before it is noted, and in every final close, one with a callback.
+void OnWrite(std::function<void()> hook);
 void OnClose(std::function<void()> hook);
-
-/// Makes every write wait until Unblock. WaitUntilBlocked returns when one does.
-void Block();
-void Unblock();
-void WaitUntilBlocked();
 
 } // namespace recorder
 
