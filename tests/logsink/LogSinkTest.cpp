@@ -1,43 +1,24 @@
 #include "logsink/LogSink.h"
+#include "tests/support/Folder.h"
 
 #include <gtest/gtest.h>
 
 #include <algorithm>
 #include <clocale>
 #include <cwchar>
-#include <filesystem>
 #include <fstream>
-#include <iterator>
 #include <set>
 #include <string>
 #include <thread>
 #include <vector>
 
-#include <unistd.h>
-
 namespace {
-
-namespace fs = std::filesystem;
 
 class LogSink : public testing::Test {
 protected:
-    LogSink() : directory(fs::temp_directory_path() / ("logsink-" + std::to_string(getpid()))) {
-        fs::create_directories(directory);
-    }
-    ~LogSink() override {
-        LogSinkSetFile(nullptr);
-        fs::remove_all(directory);
-    }
+    ~LogSink() override { LogSinkSetFile(nullptr); }
 
-    std::string Path(const char* name) const { return directory / name; }
-
-    static std::string Content(const std::string& path) {
-        std::ifstream file(path, std::ios::binary);
-        return {std::istreambuf_iterator<char>(file), {}};
-    }
-
-private:
-    fs::path directory;
+    const Folder folder;
 };
 
 TEST_F(LogSink, EveryCallIsOneLineOfUtf8) {
@@ -58,51 +39,51 @@ TEST_F(LogSink, EveryCallIsOneLineOfUtf8) {
         {std::wstring(5000, L'x'), std::string(5000, 'x') + "\n"},
     };
     std::setlocale(LC_ALL, "C");
-    const std::string path = Path("lines");
+    const std::string path = folder / "lines";
     ASSERT_EQ(LogSinkSetFile(path.c_str()), 1);
     std::string expected;
     for (const auto& [text, line] : cases) {
         EXPECT_EQ(Log(text.c_str()), 1);
         expected += line;
-        EXPECT_EQ(Content(path), expected);
+        EXPECT_EQ(ReadFile(path), expected);
     }
     EXPECT_EQ(Log(nullptr), 0);
-    EXPECT_EQ(Content(path), expected);
+    EXPECT_EQ(ReadFile(path), expected);
 }
 
 TEST_F(LogSink, GoesToStandardErrorAtFirstAndAfterNull) {
     testing::internal::CaptureStderr();
     EXPECT_EQ(Log(L"first"), 1);
-    ASSERT_EQ(LogSinkSetFile(Path("file").c_str()), 1);
+    ASSERT_EQ(LogSinkSetFile((folder / "file").c_str()), 1);
     EXPECT_EQ(Log(L"second"), 1);
     ASSERT_EQ(LogSinkSetFile(nullptr), 1);
     EXPECT_EQ(Log(L"third"), 1);
     EXPECT_EQ(testing::internal::GetCapturedStderr(), "first\nthird\n");
-    EXPECT_EQ(Content(Path("file")), "second\n");
+    EXPECT_EQ(ReadFile(folder / "file"), "second\n");
 }
 
 TEST_F(LogSink, AppendsToAFileThatExists) {
-    const std::string path = Path("old \xC3\xA9");
-    std::ofstream(path) << "old\n";
+    const std::string path = folder / "old \xC3\xA9";
+    WriteFile(path, "old\n");
     ASSERT_EQ(LogSinkSetFile(path.c_str()), 1);
     Log(L"new");
-    EXPECT_EQ(Content(path), "old\nnew\n");
+    EXPECT_EQ(ReadFile(path), "old\nnew\n");
 }
 
 TEST_F(LogSink, DiscardsForAnEmptyName) {
-    ASSERT_EQ(LogSinkSetFile(Path("file").c_str()), 1);
+    ASSERT_EQ(LogSinkSetFile((folder / "file").c_str()), 1);
     ASSERT_EQ(LogSinkSetFile(""), 1);
     testing::internal::CaptureStderr();
     EXPECT_EQ(Log(L"gone"), 1);
     EXPECT_EQ(testing::internal::GetCapturedStderr(), "");
-    EXPECT_EQ(Content(Path("file")), "");
+    EXPECT_EQ(ReadFile(folder / "file"), "");
 }
 
 TEST_F(LogSink, KeepsTheOldTargetWhenAFileCannotBeOpened) {
-    ASSERT_EQ(LogSinkSetFile(Path("file").c_str()), 1);
-    EXPECT_EQ(LogSinkSetFile(Path("missing/file").c_str()), 0);
+    ASSERT_EQ(LogSinkSetFile((folder / "file").c_str()), 1);
+    EXPECT_EQ(LogSinkSetFile((folder / "missing/file").c_str()), 0);
     Log(L"still here");
-    EXPECT_EQ(Content(Path("file")), "still here\n");
+    EXPECT_EQ(ReadFile(folder / "file"), "still here\n");
 }
 
 TEST_F(LogSink, ReportsALineThatCannotBeWritten) {
@@ -113,7 +94,7 @@ TEST_F(LogSink, ReportsALineThatCannotBeWritten) {
 TEST_F(LogSink, KeepsLinesWholeWhileThreadsWriteAndTheTargetChanges) {
     constexpr int kThreads = 4;
     constexpr int kLines = 300;
-    ASSERT_EQ(LogSinkSetFile(Path("a").c_str()), 1);
+    ASSERT_EQ(LogSinkSetFile((folder / "a").c_str()), 1);
     std::vector<std::thread> threads;
     for (int thread = 0; thread < kThreads; ++thread)
         threads.emplace_back([thread] {
@@ -122,13 +103,13 @@ TEST_F(LogSink, KeepsLinesWholeWhileThreadsWriteAndTheTargetChanges) {
                         .c_str());
         });
     for (int change = 0; change < 50; ++change)
-        EXPECT_EQ(LogSinkSetFile(Path(change % 2 == 0 ? "b" : "a").c_str()), 1);
+        EXPECT_EQ(LogSinkSetFile((folder / (change % 2 == 0 ? "b" : "a")).c_str()), 1);
     for (std::thread& thread : threads)
         thread.join();
 
     std::set<std::string> seen;
     for (const char* name : {"a", "b"}) {
-        std::ifstream file(Path(name));
+        std::ifstream file(folder / name);
         for (std::string line; std::getline(file, line);) {
             EXPECT_EQ(std::count(line.begin(), line.end(), 'x'), 200);
             EXPECT_TRUE(seen.insert(line).second);
