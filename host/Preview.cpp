@@ -81,7 +81,7 @@ std::string ReplaceFile(const std::string& path, const AVPacket& content) {
     if (written && closed && std::rename(temporary.c_str(), path.c_str()) == 0) {
         return {};
     }
-    const std::string reason = std::strerror(errno);
+    std::string reason = std::strerror(errno);
     std::remove(temporary.c_str());
     return reason;
 }
