@@ -6,7 +6,6 @@
 #include <chrono>
 #include <condition_variable>
 #include <cstddef>
-#include <deque>
 #include <exception>
 #include <mutex>
 #include <new>
@@ -35,7 +34,9 @@ struct OpaqueEventRef {
     const UInt32 eventKind;
     std::atomic<long> references{1};
     std::vector<Parameter> parameters;
-    bool queued = false; // guarded by the queue's mutex
+    // Guarded by the queue's mutex.
+    bool queued = false;
+    EventRef next = nullptr;
 };
 
 namespace {
@@ -48,6 +49,7 @@ bool Matches(const OpaqueEventRef& event, ItemCount numTypes, const EventTypeSpe
 
 } // namespace
 
+/// The events themselves are the queue's links: an event that could be made can be posted, without memory.
 struct OpaqueEventQueueRef {
     OSStatus Post(EventRef event, EventPriority priority) {
         {
@@ -56,7 +58,10 @@ struct OpaqueEventQueueRef {
                 return eventAlreadyPostedErr;
             if (size == kCapacity)
                 return eventQueueFullErr;
-            events[static_cast<std::size_t>(kEventPriorityHigh - priority)].push_back(event);
+            Line& line = lines[static_cast<std::size_t>(kEventPriorityHigh - priority)];
+            event->next = nullptr;
+            *line.end = event;
+            line.end = &event->next;
             event->queued = true;
             ++size;
             RetainEvent(event);
@@ -81,25 +86,32 @@ private:
     static constexpr EventTimeout kLongestTimeout = 1e8; // seconds; what is longer may overflow the clock
 
     EventRef Take(ItemCount numTypes, const EventTypeSpec* list, bool pull) {
-        for (auto& queue : events) {
-            const auto found = std::find_if(queue.begin(), queue.end(),
-                                            [=](EventRef event) { return Matches(*event, numTypes, list); });
-            if (found == queue.end())
-                continue;
-            const EventRef event = *found;
-            if (pull) {
-                queue.erase(found);
+        for (Line& line : lines) {
+            EventRef* link = &line.first;
+            while (*link && !Matches(**link, numTypes, list))
+                link = &(*link)->next;
+            const EventRef event = *link;
+            if (event && pull) {
+                *link = event->next;
+                if (line.end == &event->next)
+                    line.end = link;
                 event->queued = false;
                 --size;
             }
-            return event;
+            if (event)
+                return event;
         }
         return nullptr;
     }
 
+    struct Line {
+        EventRef first = nullptr;
+        EventRef* end = &first; // where the next one is linked
+    };
+
     std::mutex mutex;
     std::condition_variable arrived;
-    std::array<std::deque<EventRef>, kEventPriorityHigh + 1> events; // by priority, the highest first
+    std::array<Line, kEventPriorityHigh + 1> lines; // by priority, the highest first
     std::size_t size = 0;
 };
 
@@ -169,19 +181,16 @@ OSStatus GetEventParameter(EventRef event, EventParamName name, EventParamType d
 }
 
 EventQueueRef GetMainEventQueue() {
-    // Never freed: workers may post while the process ends.
-    static auto* const queue = new OpaqueEventQueueRef;
+    // Never destroyed: workers may post while the process ends. Never missing: it needs no memory.
+    alignas(OpaqueEventQueueRef) static std::byte place[sizeof(OpaqueEventQueueRef)];
+    static auto* const queue = new (place) OpaqueEventQueueRef;
     return queue;
 }
 
 OSStatus PostEventToQueue(EventQueueRef queue, EventRef event, EventPriority priority) {
     if (!queue || !event || priority < kEventPriorityLow || priority > kEventPriorityHigh)
         return paramErr;
-    try {
-        return queue->Post(event, priority);
-    } catch (const std::bad_alloc&) {
-        return memFullErr;
-    }
+    return queue->Post(event, priority);
 }
 
 OSStatus ReceiveNextEvent(ItemCount numTypes, const EventTypeSpec* list, EventTimeout timeout,

@@ -104,8 +104,8 @@ OSStatus GetEventParameter(EventRef event, EventParamName name, EventParamType d
 EventQueueRef GetMainEventQueue(void);
 
 /// Puts an event into the queue, which keeps a reference of its own. Higher priorities are received first;
-/// within one priority the order of posting holds. noErr, paramErr, eventAlreadyPostedErr, eventQueueFullErr
-/// or memFullErr.
+/// within one priority the order of posting holds. Needs no memory. noErr, paramErr, eventAlreadyPostedErr or
+/// eventQueueFullErr.
 OSStatus PostEventToQueue(EventQueueRef queue, EventRef event, EventPriority priority);
 
 /// Waits up to `timeout` seconds (negative: for ever) for an event of the main queue that is one of
