@@ -13,8 +13,11 @@ extern "C" {
 }
 
 #include <array>
+#include <cerrno>
 #include <memory>
+#include <new>
 #include <string>
+#include <utility>
 
 namespace av {
 
@@ -26,6 +29,9 @@ struct PacketFree {
 };
 struct CodecContextFree {
     void operator()(AVCodecContext* context) const { avcodec_free_context(&context); }
+};
+struct CodecParametersFree {
+    void operator()(AVCodecParameters* parameters) const { avcodec_parameters_free(&parameters); }
 };
 struct InputFree {
     void operator()(AVFormatContext* context) const { avformat_close_input(&context); }
@@ -52,6 +58,7 @@ struct SampleFifoFree {
 using Frame = std::unique_ptr<AVFrame, FrameFree>;
 using Packet = std::unique_ptr<AVPacket, PacketFree>;
 using CodecContext = std::unique_ptr<AVCodecContext, CodecContextFree>;
+using CodecParameters = std::unique_ptr<AVCodecParameters, CodecParametersFree>;
 /// An AVFormatContext opened with avformat_open_input.
 using Input = std::unique_ptr<AVFormatContext, InputFree>;
 /// An AVFormatContext allocated for writing; its AVIOContext is owned apart.
@@ -62,6 +69,23 @@ using Scaler = std::unique_ptr<SwsContext, ScalerFree>;
 using Resampler = std::unique_ptr<SwrContext, ResamplerFree>;
 using SampleFifo = std::unique_ptr<AVAudioFifo, SampleFifoFree>;
 
+/// Throws std::bad_alloc when the libraries' `result` says that there was no memory: that is no fault of the
+/// data or the parameters.
+inline void CheckMemory(int result) {
+    if (result == AVERROR(ENOMEM))
+        throw std::bad_alloc();
+}
+
+/// Empty ones. Throw std::bad_alloc.
+inline Packet NewPacket() {
+    Packet packet(av_packet_alloc());
+    return packet ? std::move(packet) : throw std::bad_alloc();
+}
+inline Frame NewFrame() {
+    Frame frame(av_frame_alloc());
+    return frame ? std::move(frame) : throw std::bad_alloc();
+}
+
 /// Options for an open call; what is left in it afterwards was not recognised.
 class Options {
 public:
@@ -70,8 +94,8 @@ public:
     Options& operator=(const Options&) = delete;
     ~Options() { av_dict_free(&entries_); }
 
-    void Set(const char* key, const char* value) { av_dict_set(&entries_, key, value, 0); }
-    void Set(const char* key, int64_t value) { av_dict_set_int(&entries_, key, value, 0); }
+    /// Throws std::bad_alloc.
+    void Set(const char* key, const char* value) { CheckMemory(av_dict_set(&entries_, key, value, 0)); }
     AVDictionary** Get() { return &entries_; }
 
 private:

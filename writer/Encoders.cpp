@@ -25,6 +25,7 @@ constexpr int kFreeFrameSize = 1024;
 constexpr int kKeyFrameSeconds = 5;
 
 [[noreturn]] void ThrowEncodeFailure(const AVCodecContext& context, int error) {
+    av::CheckMemory(error);
     throw WriterFailure(kWriterErrorEncode, std::string("The encoder ") + context.codec->name +
                                                 " failed: " + av::ErrorText(error) + ".");
 }
@@ -45,6 +46,7 @@ av::CodecContext NewContext(const AVCodec* codec, uint32_t code, EncoderFlags fl
 
 void Open(AVCodecContext& context, uint32_t code, const std::string& parameters) {
     const int error = avcodec_open2(&context, context.codec, nullptr);
+    av::CheckMemory(error);
     if (error < 0)
         throw WriterFailure(kWriterErrorCodec, "The encoder for \"" + CodeText(code) + "\" does not accept " +
                                                    parameters + ": " + av::ErrorText(error) + ".");
@@ -68,7 +70,7 @@ void Pump(AVCodecContext& context, AVFrame* frame, AVPacket& packet, Take take) 
 /// Speed and quality of the encoders that leave the choice to the caller.
 void SetPreset(AVCodecContext& context, AVRational rate) {
     const auto set = [&](const char* name, const char* value) {
-        av_opt_set(context.priv_data, name, value, 0);
+        av::CheckMemory(av_opt_set(context.priv_data, name, value, 0));
     };
     const int key_distance = std::max(1, static_cast<int>(std::lround(av_q2d(rate) * kKeyFrameSeconds)));
     const char* encoder = context.codec->name;
@@ -146,9 +148,7 @@ VideoEncoder::VideoEncoder(const VideoCodec& codec, const VideoSettings& setting
                            int ticksPerPicture)
     : ticksPerPicture_(ticksPerPicture),
       context_(NewContext(FindEncoder(codec), codec.code, flags)),
-      packet_(av_packet_alloc()) {
-    if (!packet_)
-        throw std::bad_alloc();
+      packet_(av::NewPacket()) {
     AVCodecContext& context = *context_;
     context.width = settings.width;
     context.height = settings.height;
@@ -212,9 +212,7 @@ int64_t VideoEncoder::TickOf(int64_t index) const {
 
 AudioEncoder::AudioEncoder(const AudioCodec& codec, const AudioSettings& settings, EncoderFlags flags)
     : context_(NewContext(FindEncoder(codec, settings.bitsPerSample), codec.code, flags)),
-      packet_(av_packet_alloc()) {
-    if (!packet_)
-        throw std::bad_alloc();
+      packet_(av::NewPacket()) {
     AVCodecContext& context = *context_;
     context.sample_rate = ChooseSampleRate(*context.codec, settings.sampleRate, settings.flashRates);
     context.time_base = {1, context.sample_rate};

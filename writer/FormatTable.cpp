@@ -10,7 +10,6 @@ extern "C" {
 #include <cctype>
 #include <cstring>
 #include <utility>
-#include <vector>
 
 namespace writer {
 namespace {
@@ -198,15 +197,15 @@ std::string CodeText(uint32_t code) {
 }
 
 const FileFormatInfo* FileFormatInfos() {
-    static const std::vector<FileFormatInfo> table = [] {
-        std::vector<FileFormatInfo> entries;
+    static const auto table = [] {
+        std::array<FileFormatInfo, kContainers.size() + 1> entries{}; // what is not filled ends the table
+        auto* entry = entries.data();
         for (const Container& container : kContainers) {
             const FileFormatInfo info = Describe(container);
             if (av_guess_format(container.muxer, nullptr, nullptr) != nullptr &&
                 (info.bHasVideo != 0 || info.bHasAudio != 0))
-                entries.push_back(info);
+                *entry++ = info;
         }
-        entries.push_back({});
         return entries;
     }();
     return table.data();

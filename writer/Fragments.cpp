@@ -14,20 +14,20 @@
 namespace writer {
 namespace {
 
-av::Input OpenPart(AvioFile& file) {
-    av::Input input(avformat_alloc_context());
-    if (!input)
-        throw std::bad_alloc();
-    input->pb = file.Io();
-    input->flags |= AVFMT_FLAG_NOFILLIN | AVFMT_FLAG_NOPARSE;
+/// Throws WriterFailure of that kind.
+av::Input OpenMovie(AvioFile& file, int kind) {
     av::Options options;
     options.Set("ignore_editlist", "1");
-    AVFormatContext* context = input.release();
+    AVFormatContext* context = avformat_alloc_context();
+    if (context == nullptr)
+        throw std::bad_alloc();
+    context->pb = file.Io();
+    context->flags |= AVFMT_FLAG_NOFILLIN | AVFMT_FLAG_NOPARSE;
     const int error = avformat_open_input(&context, nullptr, av_find_input_format("mov"), options.Get());
-    input.reset(context);
+    av::Input input(context);
+    av::CheckMemory(error);
     if (error < 0)
-        throw WriterFailure(kWriterErrorFinish,
-                            "The temporary file cannot be read: " + av::ErrorText(error) + ".");
+        throw WriterFailure(kind, "The temporary file cannot be read: " + av::ErrorText(error) + ".");
     return input;
 }
 
@@ -71,38 +71,8 @@ Box ReadBox(ByteFile& file, int64_t position) {
     return box.size < 8 ? Box{} : box;
 }
 
-} // namespace
-
-void JoinFragments(const std::shared_ptr<ByteFile>& part, const Muxer& written, const Container& container,
-                   AvioFile& out, bool bitExact, const std::function<void(double)>& progress) {
-    AvioFile file(part, AvioFile::Mode::kRead);
-    const av::Input input = OpenPart(file);
-    if (static_cast<int>(input->nb_streams) != written.StreamCount())
-        throw WriterFailure(kWriterErrorFinish,
-                            "The temporary file does not hold the streams that were written.");
-    Muxer joined(container, out, false, bitExact);
-    AddStreams(*input, written, joined);
-    joined.WriteHeader();
-    const av::Packet packet(av_packet_alloc());
-    if (!packet)
-        throw std::bad_alloc();
-    const auto size = static_cast<double>(std::max<int64_t>(1, file.Size()));
-    int error = 0;
-    while ((error = av_read_frame(input.get(), packet.get())) >= 0) {
-        const int64_t delay = written.Stream(packet->stream_index).delay;
-        packet->dts -= delay;
-        packet->pts -= delay;
-        progress(static_cast<double>(packet->pos) / size);
-        joined.Write(*packet, packet->stream_index);
-    }
-    if (error != AVERROR_EOF)
-        throw WriterFailure(kWriterErrorFinish,
-                            "The temporary file cannot be read: " + av::ErrorText(error) + ".", file.Error());
-    joined.WriteTrailer();
-}
-
-int64_t CutToWholeFragments(ByteFile& part) {
-    const int64_t end = part.Seek(0, SEEK_END);
+/// How far `part` consists of whole fragments.
+int64_t WholeSize(ByteFile& part, int64_t end) {
     int64_t whole = 0;
     for (int64_t position = 0; position < end;) {
         const Box box = ReadBox(part, position);
@@ -113,6 +83,63 @@ int64_t CutToWholeFragments(ByteFile& part) {
         if (std::memcmp(box.type.data(), "moof", 4) != 0)
             whole = position;
     }
+    return whole;
+}
+
+[[noreturn]] void ThrowIncomplete() {
+    throw WriterFailure(kWriterErrorFinish, "The temporary file does not hold all that was written.");
+}
+
+} // namespace
+
+void JoinFragments(const std::shared_ptr<ByteFile>& part, const Muxer& written, const Container& container,
+                   AvioFile& out, bool bitExact, const std::function<void(double)>& progress) {
+    // The multiplexer does not tell of data that it had no memory for.
+    const int64_t end = part->Seek(0, SEEK_END);
+    if (WholeSize(*part, end) != end)
+        ThrowIncomplete();
+    AvioFile file(part, AvioFile::Mode::kRead);
+    const av::Input input = OpenMovie(file, kWriterErrorFinish);
+    if (static_cast<int>(input->nb_streams) != written.StreamCount())
+        ThrowIncomplete();
+    Muxer joined(container, out, false, bitExact);
+    AddStreams(*input, written, joined);
+    joined.WriteHeader();
+    const av::Packet packet = av::NewPacket();
+    const auto size = static_cast<double>(std::max<int64_t>(1, file.Size()));
+    int error = 0;
+    while ((error = av_read_frame(input.get(), packet.get())) >= 0) {
+        const int64_t delay = written.Stream(packet->stream_index).delay;
+        packet->dts -= delay;
+        packet->pts -= delay;
+        progress(static_cast<double>(packet->pos) / size);
+        joined.Write(*packet, packet->stream_index);
+    }
+    av::CheckMemory(error);
+    if (error != AVERROR_EOF)
+        throw WriterFailure(kWriterErrorFinish,
+                            "The temporary file cannot be read: " + av::ErrorText(error) + ".", file.Error());
+    for (int stream = 0; stream < written.StreamCount(); ++stream) {
+        if (joined.Stream(stream).packets != written.Stream(stream).packets)
+            ThrowIncomplete();
+    }
+    joined.WriteTrailer();
+}
+
+void CheckIndex(const std::shared_ptr<ByteFile>& file, const Muxer& written) {
+    AvioFile in(file, AvioFile::Mode::kRead);
+    const av::Input input = OpenMovie(in, kWriterErrorEncode);
+    for (int stream = 0; stream < written.StreamCount(); ++stream) {
+        // Sound that is not compressed is counted in samples.
+        if (stream >= static_cast<int>(input->nb_streams) ||
+            input->streams[stream]->nb_frames < written.Stream(stream).packets)
+            throw WriterFailure(kWriterErrorEncode, "The index is not whole.");
+    }
+}
+
+int64_t CutToWholeFragments(ByteFile& part) {
+    const int64_t end = part.Seek(0, SEEK_END);
+    const int64_t whole = WholeSize(part, end);
     if (whole == end)
         return end;
     const int64_t result = part.Truncate(whole);

@@ -12,9 +12,13 @@ namespace writer {
 
 /// Writes the movie in the fragmented file `part`, written by `written`, into `out` once more with a single
 /// index. Times are those that went into `written`. `progress` is told the share done, 0 to 1. Throws
-/// WriterFailure, with kWriterErrorFinish when `part` cannot be read.
+/// WriterFailure, with kWriterErrorFinish when `part` cannot be read or does not hold all that was written.
 void JoinFragments(const std::shared_ptr<ByteFile>& part, const Muxer& written, const Container& container,
                    AvioFile& out, bool bitExact, const std::function<void(double)>& progress);
+
+/// Throws WriterFailure when the index of `file` does not name all that `written` took: the multiplexer
+/// leaves out without a word what it has no memory for.
+void CheckIndex(const std::shared_ptr<ByteFile>& file, const Muxer& written);
 
 /// Cuts a file off behind its last whole fragment, after a failure in the middle of one. Returns the new
 /// size, or a negated errno.

@@ -6,8 +6,6 @@
 #include <algorithm>
 #include <cerrno>
 #include <cstring>
-#include <filesystem>
-#include <system_error>
 #include <utility>
 
 namespace writer {
@@ -36,12 +34,6 @@ PcmFormat FormatOf(const AudioFrame& frame) {
     return {frame.nSampleRate, frame.nChannels, frame.nBitsPerSample};
 }
 
-WriterFailure SystemFailure(int kind, const std::string& what, int error) {
-    if (error == ENOSPC || error == EDQUOT)
-        kind = kWriterErrorNoSpace;
-    return {kind, what + ": " + std::strerror(error) + ".", error};
-}
-
 bool IsFragmented(const FilePlan& plan) {
     return plan.container->kind == ContainerKind::kFragmented;
 }
@@ -57,15 +49,10 @@ EncoderFlags FlagsFor(const FilePlan& plan) {
 }
 
 int AddEncoder(Muxer& muxer, const AVCodecContext& context, AVRational unit, AVRational rate, int64_t runUp) {
-    AVCodecParameters* parameters = avcodec_parameters_alloc();
-    const int error =
-        parameters == nullptr ? AVERROR(ENOMEM) : avcodec_parameters_from_context(parameters, &context);
-    const int stream =
-        error < 0 ? error : muxer.AddStream({parameters, unit, rate, context.sample_aspect_ratio, runUp});
-    avcodec_parameters_free(&parameters);
-    if (error < 0)
+    const av::CodecParameters parameters(avcodec_parameters_alloc());
+    if (!parameters || avcodec_parameters_from_context(parameters.get(), &context) < 0)
         throw std::bad_alloc();
-    return stream;
+    return muxer.AddStream({parameters.get(), unit, rate, context.sample_aspect_ratio, runUp});
 }
 
 } // namespace
@@ -81,13 +68,14 @@ MediaFile::MediaFile(const std::string& target, const EncodeParam& param, const 
     if (obstacle == EEXIST && record_->Options().bKeepExisting != 0)
         throw WriterFailure(kWriterErrorExists, "The file exists already.", EEXIST);
     if (obstacle != 0 && obstacle != EEXIST)
-        throw SystemFailure(kWriterErrorOpen, "The name belongs to something that is not a file", obstacle);
-    OpenPart();
+        throw SystemFailure(kWriterErrorOpen, obstacle, "The name belongs to something that is not a file");
     try {
+        OpenPart();
         OpenStages();
         StartPictures();
     } catch (...) {
-        files_.Remove(partPath_);
+        if (!partPath_.empty())
+            files_.Remove(partPath_);
         throw WriterFailure(Explain(std::current_exception()));
     }
     record_->SetTemporaryPath(partPath_);
@@ -97,10 +85,12 @@ MediaFile::~MediaFile() = default;
 
 void MediaFile::OpenPart() {
     int error = 0;
-    std::shared_ptr<ByteFile> file = CreateBeside(files_, target_, ".part", partPath_, error);
+    std::string path;
+    std::unique_ptr<ByteFile> file = CreateBeside(files_, target_, ".part", path, error);
     if (!file)
-        throw SystemFailure(kWriterErrorOpen,
-                            "No file can be created in the folder \"" + FolderOf(target_) + "\"", error);
+        throw SystemFailure(kWriterErrorOpen, error, "No file can be created in the folder \"%s\"",
+                            FolderOf(target_).c_str());
+    partPath_ = std::move(path);
     part_ = std::make_unique<AvioFile>(std::move(file), AvioFile::Mode::kWrite,
                                        [this] { return record_->AskAboutFullDisk(); });
 }
@@ -223,26 +213,16 @@ void MediaFile::Write(AVPacket& packet, int stream) {
 
 /// The failure in the terms of the status header. A failed file explains more than what the multiplexer made
 /// of it.
-WriterFailure MediaFile::Explain(const std::exception_ptr& error) const {
+WriterFailure MediaFile::Explain(const std::exception_ptr& error) const noexcept {
     if (const int code = part_ ? part_->Error() : 0; code != 0)
-        return SystemFailure(kWriterErrorWrite,
-                             "Writing to \"" + partPath_ + "\" failed after " +
-                                 std::to_string(part_->Size()) + " bytes",
-                             code);
-    try {
-        std::rethrow_exception(error);
-    } catch (const WriterFailure& failure) {
-        return failure;
-    } catch (const std::system_error& failure) {
-        return {kWriterErrorInternal, std::string("No thread can be started: ") + failure.what() + ".",
-                failure.code().value()};
-    } catch (const std::exception& failure) {
-        return {kWriterErrorInternal, failure.what()};
-    }
+        return SystemFailure(kWriterErrorWrite, code, "Writing to \"%s\" failed after %lld bytes",
+                             partPath_.c_str(), static_cast<long long>(part_->Size()));
+    return FailureOf(error);
 }
 
-void MediaFile::Fail(const std::exception_ptr& error) {
-    if (std::error_code unknown; !std::filesystem::exists(partPath_, unknown) && !unknown)
+/// The stages' threads end here too, where there is no memory: nothing is allocated.
+void MediaFile::Fail(const std::exception_ptr& error) noexcept {
+    if (files_.IsMissing(partPath_))
         record_->SetTemporaryPath(""); // the folder was removed meanwhile
     if (record_->Fail(Explain(error)))
         record_->Tell(kWriterEventFailed);
@@ -325,17 +305,18 @@ void MediaFile::FinishPart() {
 void MediaFile::JoinPart() {
     int error = 0;
     std::string path;
-    const std::shared_ptr<ByteFile> file = CreateBeside(files_, target_, ".joined.part", path, error);
+    std::unique_ptr<ByteFile> file = CreateBeside(files_, target_, ".joined.part", path, error);
     if (file) {
         try {
-            JoinInto(path, file);
+            JoinInto(path, std::move(file));
             files_.Remove(partPath_);
             return;
-        } catch (const WriterFailure& failure) {
+        } catch (...) {
             files_.Remove(path);
+            const WriterFailure failure = FailureOf(std::current_exception());
             if (failure.Kind() == kWriterErrorFinish)
                 throw;
-            WriteLog("Keeping the fragmented form of \"" + target_ + "\": " + failure.what());
+            WriteLog("Keeping the fragmented form of \"%s\": %s", target_.c_str(), failure.what());
         }
     }
     Publish(partPath_, *part_->File());
@@ -346,7 +327,8 @@ void MediaFile::JoinInto(const std::string& path, const std::shared_ptr<ByteFile
     JoinFragments(part_->File(), *muxer_, *plan_.container, out, plan_.bitExact,
                   [this](double share) { Progress(kDrainedShare + (kCopiedShare - kDrainedShare) * share); });
     if (const int error = out.Flush(); error != 0)
-        throw SystemFailure(kWriterErrorWrite, "Writing to \"" + path + "\" failed", error);
+        throw SystemFailure(kWriterErrorWrite, error, "Writing to \"%s\" failed", path.c_str());
+    CheckIndex(file, *muxer_);
     Publish(path, *file);
     record_->Update([&out](WriterStatus& status) { status.llBytesWritten = out.Size(); });
 }
@@ -355,13 +337,14 @@ void MediaFile::JoinInto(const std::string& path, const std::shared_ptr<ByteFile
 void MediaFile::Publish(const std::string& path, ByteFile& file) {
     Progress(kCopiedShare);
     if (const int64_t result = file.Sync(); result < 0)
-        throw SystemFailure(kWriterErrorFinish, "Syncing \"" + path + "\" failed", static_cast<int>(-result));
+        throw SystemFailure(kWriterErrorFinish, static_cast<int>(-result), "Syncing \"%s\" failed",
+                            path.c_str());
     const bool replace = record_->Options().bKeepExisting == 0;
     if (const int error = files_.Rename(path, target_, replace); error != 0)
-        throw SystemFailure(kWriterErrorFinish, "Renaming \"" + path + "\" failed", error);
+        throw SystemFailure(kWriterErrorFinish, error, "Renaming \"%s\" failed", path.c_str());
     record_->SetTemporaryPath("");
     if (const int error = files_.SyncFolder(target_); error != 0)
-        WriteLog("Syncing the folder of \"" + target_ + "\" failed: " + std::strerror(error) + ".");
+        WriteLog("Syncing the folder of \"%s\" failed: %s.", target_.c_str(), std::strerror(error));
 }
 
 /// Leaves the temporary file in a form that players take, or removes it.
@@ -371,12 +354,13 @@ void MediaFile::CloseFailed() {
         record_->SetTemporaryPath("");
         return;
     }
-    if (part_->Error() == 0) {
+    if (part_->Error() == 0 && !muxer_->Empty()) {
         try {
             muxer_->WriteTrailer();
             part_->Flush();
-        } catch (const WriterFailure& failure) {
-            WriteLog("The end of \"" + partPath_ + "\" is missing: " + failure.what());
+        } catch (...) {
+            WriteLog("The end of \"%s\" is missing: %s", partPath_.c_str(),
+                     FailureOf(std::current_exception()).what());
         }
     }
     const int64_t size = IsFragmented(plan_) ? CutToWholeFragments(*part_->File()) : part_->Size();

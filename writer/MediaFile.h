@@ -57,8 +57,8 @@ private:
     bool AddSound(const AudioFrame& frame, const PcmFormat& format);
     bool PushSound();
     void Write(AVPacket& packet, int stream);
-    void Fail(const std::exception_ptr& error);
-    WriterFailure Explain(const std::exception_ptr& error) const;
+    void Fail(const std::exception_ptr& error) noexcept;
+    WriterFailure Explain(const std::exception_ptr& error) const noexcept;
     void CancelStages();
     void DrainStages();
     void FinishPart();

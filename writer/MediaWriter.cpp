@@ -28,28 +28,30 @@ Result Guarded(Result otherwise, Call call) noexcept {
     }
 }
 
-void Refuse(const std::shared_ptr<FileRecord>& record, const WriterFailure& failure) {
-    record->Fail(failure);
-    record->Update([](WriterStatus& status) { status.nState = kWriterFileFailed; });
-    record->Tell(kWriterEventRefused);
+void Refuse(FileRecord& record, const WriterFailure& failure) {
+    record.Fail(failure);
+    record.Update([](WriterStatus& status) { status.nState = kWriterFileFailed; });
+    record.Tell(kWriterEventRefused);
 }
 
 MediaFile* Create(const wchar_t* fileName, const EncodeParam* param, const VideoFormat* video,
                   const AudioFormat* audio) {
-    const std::string target = fileName == nullptr ? std::string() : text::ToUtf8(fileName);
-    const std::shared_ptr<FileRecord> record = StatusBoard::Instance().Open(target);
+    std::shared_ptr<FileRecord> record;
     try {
+        const std::string target = fileName == nullptr ? std::string() : text::ToUtf8(fileName);
+        record = StatusBoard::Instance().Open(target);
         if (target.empty() || param == nullptr)
             throw WriterFailure(kWriterErrorArgument, "There is no file name, or there are no parameters.");
         auto file = std::make_unique<MediaFile>(target, *param, video, audio, record, writer::SystemFiles());
         record->Tell(kWriterEventOpened);
         return file.release();
-    } catch (const WriterFailure& failure) {
-        Refuse(record, failure);
-    } catch (const std::exception& failure) {
-        Refuse(record, {kWriterErrorInternal, failure.what()});
+    } catch (...) {
+        const WriterFailure failure = writer::FailureOf(std::current_exception());
+        FileRecord unlisted(0, "",
+                            StatusBoard::Instance().Options()); // where there is no memory for a record
+        Refuse(record ? *record : unlisted, failure);
+        return nullptr;
     }
-    return nullptr;
 }
 
 int CopyStatus(const std::shared_ptr<const FileRecord>& record, WriterStatus* status) {

@@ -4,6 +4,10 @@
 #include "writer/WriterFailure.h"
 #include "writer/WriterStatus.h"
 
+extern "C" {
+#include <libavutil/opt.h>
+}
+
 #include <algorithm>
 #include <new>
 #include <string>
@@ -33,32 +37,34 @@ bool IsRunUp(const AVPacket& packet, const AVStream& stream) {
     return stream.codecpar->codec_type == AVMEDIA_TYPE_AUDIO && packet.pts + packet.duration / 2 < 0;
 }
 
-void SetFragments(const AVFormatContext& output, av::Options& options) {
+void SetOption(AVFormatContext& output, const char* name, const std::string& value) {
+    av::CheckMemory(av_opt_set(&output, name, value.c_str(), AV_OPT_SEARCH_CHILDREN));
+}
+
+void SetFragments(AVFormatContext& output) {
     // Times are written as they are, from the first fragment on.
     std::string flags = "empty_moov+default_base_moof+frag_discont";
-    options.Set("use_editlist", "0");
-    options.Set("avoid_negative_ts", "disabled");
+    SetOption(output, "use_editlist", "0");
+    SetOption(output, "avoid_negative_ts", "disabled");
     if (HasPictures(output)) {
         flags += "+frag_keyframe";
-        options.Set("min_frag_duration", kFragmentLength);
+        SetOption(output, "min_frag_duration", std::to_string(kFragmentLength));
     } else {
-        options.Set("frag_duration", kFragmentLength);
+        SetOption(output, "frag_duration", std::to_string(kFragmentLength));
     }
     // The description of this codec is only known from its first packet.
     if (Has(output, AV_CODEC_ID_AC3))
         flags += "+delay_moov";
-    options.Set("movflags", flags.c_str());
+    SetOption(output, "movflags", flags);
 }
 
 } // namespace
 
 Muxer::Muxer(const Container& container, AvioFile& file, bool fragmented, bool bitExact)
-    : container_(container), fragmented_(fragmented), packet_(av_packet_alloc()) {
+    : container_(container), fragmented_(fragmented), packet_(av::NewPacket()) {
     AVFormatContext* output = nullptr;
     const int error = avformat_alloc_output_context2(&output, nullptr, container.muxer, nullptr);
     output_.reset(output);
-    if (!packet_)
-        throw std::bad_alloc();
     Check(error, "cannot be made");
     output_->pb = file.Io();
     output_->flags |= AVFMT_FLAG_CUSTOM_IO;
@@ -80,12 +86,13 @@ int Muxer::AddStream(const MuxedStream& stream) {
 }
 
 void Muxer::WriteHeader() {
-    av::Options options;
+    // Not handed over with the header: of options that there is no memory for, that tells nothing.
     if (fragmented_)
-        SetFragments(*output_, options);
+        SetFragments(*output_);
     else if (container_.kind == ContainerKind::kSteadyRate)
-        options.Set("avoid_negative_ts", "disabled"); // Moving pictures by less than one would lose one.
-    Check(avformat_write_header(output_.get(), options.Get()), "refuses its header");
+        SetOption(*output_, "avoid_negative_ts",
+                  "disabled"); // Moving pictures by less than one would lose one.
+    Check(avformat_write_header(output_.get(), nullptr), "refuses its header");
     if (fragmented_)
         SetDelays();
 }
@@ -133,6 +140,7 @@ void Muxer::Write(AVPacket& packet, int stream) {
     state.lastDts = packet_->dts;
     packet_->stream_index = stream;
     Check(av_interleaved_write_frame(output_.get(), packet_.get()), "refuses a packet");
+    ++state.packets;
 }
 
 void Muxer::WriteTrailer() {
@@ -150,7 +158,14 @@ Muxer::Written Muxer::Stream(int stream) const {
     const int64_t run_up = av_rescale_q(state.runUp, state.unit, out->time_base);
     return {{out->codecpar, out->time_base, out->avg_frame_rate, out->sample_aspect_ratio, run_up},
             state.delay,
+            state.packets,
             static_cast<double>(std::max<int64_t>(0, length)) * av_q2d(state.unit)};
+}
+
+bool Muxer::Empty() const {
+    const Turn turn(*this);
+    return std::all_of(streams_.begin(), streams_.end(),
+                       [](const State& stream) { return stream.packets == 0; });
 }
 
 void Muxer::NoteTimes(State& state, const AVPacket& packet) {
@@ -161,6 +176,7 @@ void Muxer::NoteTimes(State& state, const AVPacket& packet) {
 }
 
 void Muxer::Check(int result, const char* what) const {
+    av::CheckMemory(result);
     if (result < 0)
         throw WriterFailure(kWriterErrorEncode,
                             std::string("The container ") + what + ": " + av::ErrorText(result) + ".");

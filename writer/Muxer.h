@@ -26,8 +26,8 @@ struct MuxedStream {
 class Muxer {
 public:
     /// `fragmented`: the file can be played up to wherever it ends, at the price of an index spread all over
-    /// it. All functions throw WriterFailure (kWriterErrorEncode); where `file` has failed, its error is the
-    /// real reason.
+    /// it. All functions throw WriterFailure (kWriterErrorEncode) or std::bad_alloc; where `file` has failed,
+    /// its error is the real reason.
     Muxer(const Container& container, AvioFile& file, bool fragmented, bool bitExact);
 
     /// Returns the stream's number, from 0 on. A fragmented file cannot express times below 0: all its times
@@ -44,10 +44,14 @@ public:
     /// What a reader of the file, and a second muxer for the same packets, need to know of a stream.
     struct Written {
         MuxedStream description; ///< In the file's unit.
-        int64_t delay;  ///< By how much times in the file are later than those that came, in that unit.
+        int64_t delay; ///< By how much times in the file are later than those that came, in that unit.
+        int64_t packets;
         double seconds; ///< From the start of the first packet to the end of the last, without run-up.
     };
     Written Stream(int stream) const;
+
+    /// Whether no packet was taken yet.
+    bool Empty() const;
 
     int StreamCount() const { return static_cast<int>(streams_.size()); }
 
@@ -57,6 +61,7 @@ private:
         int64_t runUp = 0;
         int64_t delay = 0; ///< In the file's unit.
         int64_t lastDts = AV_NOPTS_VALUE;
+        int64_t packets = 0;
         bool begun = false;
         int64_t firstPts = 0; ///< In the stream's own unit, as endPts.
         int64_t endPts = 0;

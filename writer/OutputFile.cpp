@@ -1,13 +1,17 @@
 #include "writer/OutputFile.h"
 
 #include <algorithm>
+#include <array>
 #include <cerrno>
 #include <climits>
 #include <cstdio>
 #include <cstdlib>
 #include <memory>
+#include <new>
+#include <utility>
 
 #include <fcntl.h>
+#include <libgen.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -26,8 +30,19 @@ int64_t Retry(Call call) {
 
 class PosixFile final : public ByteFile {
 public:
-    explicit PosixFile(int descriptor) : descriptor_(descriptor) {}
-    ~PosixFile() override { close(descriptor_); }
+    PosixFile() = default;
+    ~PosixFile() override {
+        if (descriptor_ >= 0)
+            close(descriptor_);
+    }
+
+    /// 0, or an errno value.
+    int Create(const std::string& path) {
+        const int64_t result =
+            Retry([&] { return open(path.c_str(), O_RDWR | O_CREAT | O_EXCL | O_CLOEXEC, 0666); });
+        descriptor_ = static_cast<int>(result);
+        return result < 0 ? static_cast<int>(-result) : 0;
+    }
 
     int64_t Write(const uint8_t* data, int64_t size) override {
         return Retry([&] { return write(descriptor_, data, static_cast<size_t>(size)); });
@@ -46,16 +61,15 @@ public:
     }
 
 private:
-    const int descriptor_;
+    int descriptor_ = -1;
 };
 
 class PosixFiles final : public FileSystem {
 public:
     std::unique_ptr<ByteFile> Create(const std::string& path, int& error) override {
-        const int64_t descriptor =
-            Retry([&] { return open(path.c_str(), O_RDWR | O_CREAT | O_EXCL | O_CLOEXEC, 0666); });
-        error = descriptor < 0 ? static_cast<int>(-descriptor) : 0;
-        return descriptor < 0 ? nullptr : std::make_unique<PosixFile>(static_cast<int>(descriptor));
+        auto file = std::make_unique<PosixFile>(); // first: without memory nothing must be left on the disk
+        error = file->Create(path);
+        return error != 0 ? nullptr : std::move(file);
     }
 
     int Rename(const std::string& from, const std::string& to, bool replace) override {
@@ -73,8 +87,14 @@ public:
 
     int Remove(const std::string& path) override { return unlink(path.c_str()) == 0 ? 0 : errno; }
 
+    bool IsMissing(const std::string& path) override {
+        return access(path.c_str(), F_OK) != 0 && (errno == ENOENT || errno == ENOTDIR);
+    }
+
     int SyncFolder(const std::string& path) override {
-        const int descriptor = open(FolderOf(path).c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
+        std::array<char, PATH_MAX> folder; // no memory is wanted where the file has its name already
+        std::snprintf(folder.data(), folder.size(), "%s", path.c_str());
+        const int descriptor = open(dirname(folder.data()), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
         if (descriptor < 0)
             return errno;
         const int error = fsync(descriptor) == 0 ? 0 : errno;
@@ -112,6 +132,8 @@ int CheckTarget(const std::string& path) {
 
 std::string ResolveTarget(const std::string& path) {
     const std::unique_ptr<char, decltype(&std::free)> real(realpath(path.c_str(), nullptr), &std::free);
+    if (!real && errno == ENOMEM)
+        throw std::bad_alloc();
     return real ? std::string(real.get()) : path;
 }
 

@@ -42,6 +42,8 @@ public:
     /// Gives `from` the name `to`, in one step; EEXIST when `to` exists and must not be replaced.
     virtual int Rename(const std::string& from, const std::string& to, bool replace) = 0;
     virtual int Remove(const std::string& path) = 0;
+    /// Whether there is certainly no file of that name. Allocates nothing.
+    virtual bool IsMissing(const std::string& path) = 0;
     /// Makes a rename in the folder of `path` last.
     virtual int SyncFolder(const std::string& path) = 0;
 };
@@ -53,7 +55,7 @@ FileSystem& SystemFiles();
 /// else that is not a regular file. Links are followed.
 int CheckTarget(const std::string& path);
 
-/// Where the data of `path` really goes: links are followed, so that they stay links.
+/// Where the data of `path` really goes: links are followed, so that they stay links. Throws std::bad_alloc.
 std::string ResolveTarget(const std::string& path);
 
 /// Creates a file beside `target` whose name is that of the target with `suffix`, a number when that is

@@ -104,10 +104,8 @@ av::Frame FramePool::Get(AVPixelFormat format, int width, int height) {
         width_ = width;
         height_ = height;
     }
-    av::Frame frame(av_frame_alloc());
-    if (!frame || pool_ == nullptr)
-        throw std::bad_alloc();
-    frame->buf[0] = av_buffer_pool_get(pool_);
+    av::Frame frame = av::NewFrame();
+    frame->buf[0] = pool_ != nullptr ? av_buffer_pool_get(pool_) : nullptr;
     if (frame->buf[0] == nullptr)
         throw std::bad_alloc();
     frame->format = format;
@@ -136,7 +134,9 @@ av::Frame PictureScaler::Convert(av::Frame picture) {
     for (int plane = 1; plane < 3; ++plane)
         planes[plane] = frame->data[plane] + static_cast<ptrdiff_t>(fit_.top / 2) * frame->linesize[plane] +
                         fit_.left / 2;
-    sws_scale(scaler_.get(), picture->data, picture->linesize, 0, picture->height, planes, frame->linesize);
+    if (sws_scale(scaler_.get(), picture->data, picture->linesize, 0, picture->height, planes,
+                  frame->linesize) < 0)
+        throw std::bad_alloc();
     RepeatEdges(*frame, output_.padWidth, output_.padHeight);
     return frame;
 }

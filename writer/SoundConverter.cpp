@@ -46,6 +46,7 @@ void Repack(const PcmFormat& format, int channels, const uint8_t* data, int fram
 }
 
 [[noreturn]] void ThrowUnconvertible(const PcmFormat& format, int error) {
+    av::CheckMemory(error);
     throw WriterFailure(kWriterErrorEncode, "Sound of " + std::to_string(format.rate) + " Hz with " +
                                                 std::to_string(format.channels) + " channels of " +
                                                 std::to_string(format.bits) +
@@ -151,7 +152,9 @@ void SoundConverter::Drain() {
             break;
         const av::Frame frame = NewFrame(left);
         const int made = swr_convert(resampler_.get(), frame->extended_data, left, nullptr, 0);
-        if (made <= 0)
+        if (made < 0)
+            ThrowUnconvertible(source_, made);
+        if (made == 0)
             break;
         if (av_audio_fifo_write(fifo_.get(), reinterpret_cast<void**>(frame->extended_data), made) < made)
             throw std::bad_alloc();
@@ -160,9 +163,7 @@ void SoundConverter::Drain() {
 }
 
 av::Frame SoundConverter::NewFrame(int samples) const {
-    av::Frame frame(av_frame_alloc());
-    if (!frame)
-        throw std::bad_alloc();
+    av::Frame frame = av::NewFrame();
     frame->nb_samples = samples;
     frame->format = format_;
     frame->sample_rate = rate_;

@@ -4,22 +4,15 @@
 #include "text/Utf8.h"
 
 #include <algorithm>
-#include <cstring>
+#include <array>
+#include <cstdarg>
+#include <cstdio>
+#include <exception>
 
 namespace writer {
 namespace {
 
 constexpr size_t kRemembered = 64;
-
-/// Copies as much as fits, without leaving half a UTF-8 character, always terminated.
-template <size_t Size>
-void CopyText(char (&to)[Size], const std::string& text) {
-    size_t length = std::min(text.size(), Size - 1);
-    while (length < text.size() && length > 0 && (static_cast<unsigned char>(text[length]) & 0xC0) == 0x80)
-        --length;
-    std::memcpy(to, text.data(), length);
-    to[length] = '\0';
-}
 
 bool IsOpen(const FileRecord& record) {
     const int state = record.Snapshot().nState;
@@ -28,11 +21,11 @@ bool IsOpen(const FileRecord& record) {
 
 } // namespace
 
-FileRecord::FileRecord(int sequence, const std::string& path, const WriterOptions& options)
+FileRecord::FileRecord(int sequence, std::string_view path, const WriterOptions& options)
     : options_(options) {
     status_.nSequence = sequence;
     status_.nState = kWriterFileWriting;
-    CopyText(status_.szPath, path);
+    CopyText(status_.szPath, sizeof status_.szPath, path);
 }
 
 WriterStatus FileRecord::Snapshot() const {
@@ -40,18 +33,16 @@ WriterStatus FileRecord::Snapshot() const {
     return status_;
 }
 
-bool FileRecord::Fail(const WriterFailure& failure) {
-    std::string line;
+bool FileRecord::Fail(const WriterFailure& failure) noexcept {
     {
         const std::lock_guard lock(mutex_);
         if (status_.nError != kWriterErrorNone)
             return false;
         status_.nError = failure.Kind();
         status_.nSystemError = failure.SystemError();
-        CopyText(status_.szWhat, failure.what());
-        line = std::string("Failed: ") + status_.szPath + ": " + failure.what();
+        CopyText(status_.szWhat, sizeof status_.szWhat, failure.what());
     }
-    WriteLog(line);
+    WriteLog("Failed: %s: %s", status_.szPath, failure.what());
     return true;
 }
 
@@ -60,9 +51,9 @@ bool FileRecord::Failed() const {
     return status_.nError != kWriterErrorNone;
 }
 
-void FileRecord::SetTemporaryPath(const std::string& path) {
+void FileRecord::SetTemporaryPath(std::string_view path) {
     const std::lock_guard lock(mutex_);
-    CopyText(status_.szTemporaryPath, path);
+    CopyText(status_.szTemporaryPath, sizeof status_.szTemporaryPath, path);
 }
 
 void FileRecord::Tell(int event) const {
@@ -89,7 +80,12 @@ void StatusBoard::SetOptions(const WriterOptions& options) {
     options_ = options;
 }
 
-std::shared_ptr<FileRecord> StatusBoard::Open(const std::string& path) {
+WriterOptions StatusBoard::Options() const {
+    const std::lock_guard lock(mutex_);
+    return options_;
+}
+
+std::shared_ptr<FileRecord> StatusBoard::Open(std::string_view path) {
     const std::lock_guard lock(mutex_);
     auto record = std::make_shared<FileRecord>(count_ + 1, path, options_);
     records_.push_back(record);
@@ -131,8 +127,16 @@ void StatusBoard::ForgetOld() {
     }
 }
 
-void WriteLog(const std::string& text) {
-    LogEx(L"MediaWriter::%ls\r\n", text::FromUtf8(text).c_str());
+void WriteLog(const char* format, ...) noexcept {
+    std::array<char, kWriterPathSize + kWriterTextSize> text;
+    va_list arguments;
+    va_start(arguments, format);
+    std::vsnprintf(text.data(), text.size(), format, arguments);
+    va_end(arguments);
+    try {
+        LogEx(L"MediaWriter::%ls\r\n", text::FromUtf8(text.data()).c_str());
+    } catch (const std::exception&) { // no memory for the line
+    }
 }
 
 } // namespace writer

@@ -5,17 +5,17 @@
 #include "writer/WriterFailure.h"
 #include "writer/WriterStatus.h"
 
-#include <deque>
 #include <memory>
 #include <mutex>
-#include <string>
+#include <string_view>
+#include <vector>
 
 namespace writer {
 
 /// The status of one file. Thread-safe; the listener is never called under a lock.
 class FileRecord {
 public:
-    FileRecord(int sequence, const std::string& path, const WriterOptions& options);
+    FileRecord(int sequence, std::string_view path, const WriterOptions& options);
 
     const WriterOptions& Options() const { return options_; }
 
@@ -29,10 +29,10 @@ public:
     }
 
     /// Notes a failure unless there is one already; true when this was the first. Logs it.
-    bool Fail(const WriterFailure& failure);
+    bool Fail(const WriterFailure& failure) noexcept;
     bool Failed() const;
 
-    void SetTemporaryPath(const std::string& path);
+    void SetTemporaryPath(std::string_view path);
 
     /// Calls the listener with a kWriterEvent.
     void Tell(int event) const;
@@ -52,9 +52,10 @@ public:
     static StatusBoard& Instance();
 
     void SetOptions(const WriterOptions& options);
+    WriterOptions Options() const;
 
     /// Gives the next number to a file named `path`.
-    std::shared_ptr<FileRecord> Open(const std::string& path);
+    std::shared_ptr<FileRecord> Open(std::string_view path);
 
     int Count() const;
 
@@ -71,11 +72,11 @@ private:
     mutable std::mutex mutex_;
     WriterOptions options_{};
     int count_ = 0;
-    std::deque<std::shared_ptr<FileRecord>> records_; ///< Rising numbers.
+    std::vector<std::shared_ptr<FileRecord>> records_; ///< Rising numbers.
 };
 
-/// One line to the log sink; `text` is UTF-8.
-void WriteLog(const std::string& text);
+/// One line to the log sink, of UTF-8 texts, as printf writes it. Lost when there is no memory.
+[[gnu::format(printf, 1, 2)]] void WriteLog(const char* format, ...) noexcept;
 
 } // namespace writer
 

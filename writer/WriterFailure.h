@@ -2,25 +2,45 @@
 #ifndef MOVIECONV_WRITER_WRITERFAILURE_H
 #define MOVIECONV_WRITER_WRITERFAILURE_H
 
-#include <stdexcept>
-#include <string>
+#include "writer/WriterStatus.h"
+
+#include <cstddef>
+#include <exception>
+#include <string_view>
 
 namespace writer {
 
-/// Why a file could not be created or written, in the terms of writer/WriterStatus.h.
-class WriterFailure : public std::runtime_error {
+/// Copies as much as fits into the `size` bytes of `to`, without leaving half a UTF-8 character, always
+/// terminated.
+void CopyText(char* to, size_t size, std::string_view text) noexcept;
+
+/// Why a file could not be created or written, in the terms of writer/WriterStatus.h. Holds its text itself:
+/// that there is no memory has to be said without any.
+class WriterFailure : public std::exception {
 public:
     /// `kind` is a kWriterError code, `what` a sentence for users, `systemError` an errno or 0.
-    WriterFailure(int kind, const std::string& what, int systemError = 0)
-        : std::runtime_error(what), kind_(kind), systemError_(systemError) {}
+    WriterFailure(int kind, std::string_view what, int systemError = 0) noexcept
+        : kind_(kind), systemError_(systemError) {
+        CopyText(what_, sizeof what_, what);
+    }
 
+    const char* what() const noexcept override { return what_; }
     int Kind() const { return kind_; }
     int SystemError() const { return systemError_; }
 
 private:
     int kind_;
     int systemError_;
+    char what_[kWriterTextSize];
 };
+
+/// What the system's `error` kept from being done; `format` and what follows name that as printf does. A full
+/// disk is a kind of its own.
+[[gnu::format(printf, 3, 4)]] WriterFailure SystemFailure(int kind, int error, const char* format,
+                                                          ...) noexcept;
+
+/// Any exception in the same terms.
+WriterFailure FailureOf(const std::exception_ptr& error) noexcept;
 
 } // namespace writer
 

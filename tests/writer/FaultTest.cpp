@@ -76,6 +76,7 @@ public:
                                         : writer::SystemFiles().Rename(from, to, replace);
     }
     int Remove(const std::string& path) override { return writer::SystemFiles().Remove(path); }
+    bool IsMissing(const std::string& path) override { return writer::SystemFiles().IsMissing(path); }
     int SyncFolder(const std::string& path) override { return writer::SystemFiles().SyncFolder(path); }
 
 private:
