@@ -10,6 +10,7 @@
 #include <fmt/format.h>
 #include <memory>
 #include <mutex>
+#include <new>
 #include <poll.h>
 #include <string>
 #include <sys/eventfd.h>
@@ -150,12 +151,15 @@ void ControlInput::TakeKeys() {
 
 void ControlInput::LeaveAtOnce(int signal) {
     RestoreTerminal();
-    const auto status = std::make_unique<WriterStatus>();
-    if (armed_ && MWGetFileStatus(MWGetFileCount(), status.get()) != 0 &&
-        status->szTemporaryPath[0] != '\0') {
-        WriteAll(STDERR_FILENO,
-                 fmt::format("\nmovieconv: left at once; what was written so far is in \"{}\"\n",
-                             status->szTemporaryPath));
+    try {
+        const auto status = std::make_unique<WriterStatus>();
+        if (armed_ && MWGetFileStatus(MWGetFileCount(), status.get()) != 0 &&
+            status->szTemporaryPath[0] != '\0') {
+            WriteAll(STDERR_FILENO,
+                     fmt::format("\nmovieconv: left at once; what was written so far is in \"{}\"\n",
+                                 status->szTemporaryPath));
+        }
+    } catch (const std::bad_alloc&) { // leaving matters more than the message
     }
     // Ends as if the signal had not been caught, which the shell shows as 128 plus its number.
     std::signal(signal, SIG_DFL);

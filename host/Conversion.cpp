@@ -77,10 +77,15 @@ ExitCode Conversion::Run() {
         0) {
         throw Failure(ExitCode::kInternal, "the conversion could not be started");
     }
-    if (MCWait(converter_.get(), 0) == 0 && !ended_) {
+    if (MCWait(converter_.get(), 0) == 0 && outcome_ == kNone) {
         throw Failure(ExitCode::kInternal, "no thread could be started for the conversion");
     }
-    WaitForEnd();
+    try {
+        WaitForEnd();
+    } catch (...) {
+        Stop(); // lest the converter's end wait for a slow source
+        throw;
+    }
     MCWait(converter_.get(), MC_INFINITE);
     return Conclude();
 }
@@ -106,24 +111,24 @@ unsigned Conversion::OnProgress(void* context, unsigned kind, unsigned value, ui
         }
     }
     if (kind == 1) {
-        conversion->ended_ = true;
-        PostHostEvent(EventKind::kFinished, value);
+        conversion->outcome_ = static_cast<int>(value);
+        PostHostEvent(EventKind::kFinished);
     }
     return 1;
 }
 
 void Conversion::WaitForEnd() {
-    while (!finished_) {
+    while (outcome_ == kNone) {
         Event event{};
         const bool received = ReceiveHostEvent(paused_ ? -1 : kTickSeconds, event);
         UpdateClock();
         if (received) {
             Handle(event);
         }
-        if (!finished_ && WriterWatch::FileVanished()) {
+        if (outcome_ == kNone && WriterWatch::FileVanished()) {
             Stop(); // whatever else were converted would be lost
         }
-        if (!finished_) {
+        if (outcome_ == kNone) {
             ReportProgress();
         }
     }
@@ -144,9 +149,6 @@ void Conversion::UpdateClock() {
 void Conversion::Handle(const Event& event) {
     switch (event.kind) {
     case EventKind::kFinished:
-        outcome_ = event.value;
-        finished_ = true;
-        break;
     case EventKind::kProgress:
         break;
     case EventKind::kWriterNews:
@@ -271,13 +273,15 @@ std::optional<Failure> Conversion::Verdict() {
     if (files_.FirstFailure()) {
         return files_.FirstFailure();
     }
+    std::string reason = movie_.ReadError();
     if (outcome_ == kOutcomeFailed) {
-        return Failure(ExitCode::kCannotRead, fmt::format("\"{}\" holds nothing to convert", options_.input));
+        return Failure(ExitCode::kCannotRead,
+                       reason.empty() ? fmt::format("\"{}\" holds nothing to convert", options_.input)
+                                      : fmt::format("cannot read \"{}\": {}", options_.input, reason));
     }
     if (files_.Complete() == 0) {
         return Failure(ExitCode::kInternal, fmt::format("no file was completed for \"{}\"", options_.output));
     }
-    std::string reason = movie_.ReadError();
     if (reason.empty() && EndedEarly() && HasShrunk(movie_.Info())) {
         reason = "the file was cut meanwhile";
     }

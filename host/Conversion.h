@@ -41,6 +41,8 @@ public:
     ExitCode Run();
 
 private:
+    static constexpr int kNone = -1;
+
     static unsigned OnProgress(void* context, unsigned kind, unsigned value, uintptr_t info);
 
     void WarnOfSmallRoom();
@@ -71,14 +73,12 @@ private:
 
     // The engine's worker sets these.
     std::atomic<double> position_{0}; // in seconds
-    std::atomic<bool> ended_{false};
+    std::atomic<int> outcome_{kNone}; // once the worker has nothing more to say
 
     WorkClock clock_;
     SpeedMeter speed_;
     bool paused_ = false;
     bool userStopped_ = false;
-    bool finished_ = false;
-    unsigned outcome_ = kOutcomeFailed;
     Phase shownPhase_ = Phase::kConverting;
 };
 

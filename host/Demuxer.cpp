@@ -4,6 +4,9 @@
 
 #include <algorithm>
 #include <cstdlib>
+#include <new>
+#include <system_error>
+#include <utility>
 
 namespace host {
 namespace {
@@ -15,6 +18,15 @@ constexpr int64_t kLargestStep = 10 * kMediaSecond; // between packets of one st
 constexpr int64_t kLargestFall = kMediaSecond / 2;  // likewise, backwards
 constexpr double kPreroll = 0.2;                    // codecs need a little before the first good sample
 constexpr int kProbedPackets = 2000;                // read to find the picture where decoding can begin
+
+/// Writes what went wrong into `reason`, which stays as it is when there is no memory for it.
+void Describe(const std::exception& error, std::string& reason) noexcept {
+    try {
+        const bool threads = dynamic_cast<const std::system_error*>(&error) != nullptr;
+        reason = std::string(threads ? "no thread can be started: " : "") + error.what();
+    } catch (const std::bad_alloc&) {
+    }
+}
 
 } // namespace
 
@@ -67,7 +79,7 @@ bool Demuxer::KeyPictureAtOrBefore(int64_t mediaTime) {
     if (pictures == nullptr) {
         return true;
     }
-    const av::Packet packet(av_packet_alloc());
+    const av::Packet packet = av::NewPacket();
     for (int i = 0; i < kProbedPackets && av_read_frame(source_.Context(), packet.get()) >= 0; ++i) {
         const bool isKey = packet->stream_index == pictures->index && (packet->flags & AV_PKT_FLAG_KEY) != 0;
         const int64_t stamp = packet->pts != AV_NOPTS_VALUE ? packet->pts : packet->dts;
@@ -116,11 +128,18 @@ void Demuxer::Stop() {
     changed_.notify_all();
 }
 
-void Demuxer::Fail(const std::string& reason) {
+void Demuxer::Fail(const std::exception_ptr& failure) noexcept {
+    std::string reason = "no memory"; // short enough to need none
+    try {
+        std::rethrow_exception(failure);
+    } catch (const std::bad_alloc&) {
+    } catch (const std::exception& error) {
+        Describe(error, reason);
+    }
     {
         const std::lock_guard lock(mutex_);
         if (readError_.empty()) {
-            readError_ = reason;
+            readError_ = std::move(reason);
         }
     }
     Stop();
@@ -173,8 +192,9 @@ void Demuxer::Run() {
 
 /// Reads one packet and queues it. False at the end, or when nothing more can be read.
 bool Demuxer::ReadOne() {
-    av::Packet packet(av_packet_alloc());
-    const int result = packet ? av_read_frame(source_.Context(), packet.get()) : AVERROR(ENOMEM);
+    av::Packet packet = av::NewPacket();
+    const int result = av_read_frame(source_.Context(), packet.get());
+    av::CheckMemory(result);
     if (result == AVERROR(EAGAIN) || (result == AVERROR_INVALIDDATA && ++failedReads_ < kToleratedFailures)) {
         return true;
     }

@@ -11,10 +11,10 @@
 
 #include <condition_variable>
 #include <deque>
+#include <exception>
 #include <map>
 #include <mutex>
 #include <string>
-#include <system_error>
 #include <thread>
 
 namespace host {
@@ -44,11 +44,8 @@ public:
         try {
             work();
             return true;
-        } catch (const std::system_error& failure) {
-            Fail(std::string("no thread can be started: ") + failure.what());
-            return false;
-        } catch (const std::exception& failure) {
-            Fail(failure.what());
+        } catch (...) {
+            Fail(std::current_exception());
             return false;
         }
     }
@@ -67,7 +64,7 @@ private:
 
     void Start();
     void Run();
-    void Fail(const std::string& reason);
+    void Fail(const std::exception_ptr& failure) noexcept;
     bool AwaitDemand();
     bool ReadOne();
     bool KeyPictureAtOrBefore(int64_t mediaTime);

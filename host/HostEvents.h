@@ -8,7 +8,7 @@
 namespace host {
 
 enum class EventKind : uint32_t {
-    kFinished = 1,   ///< The engine's worker has nothing more to say; the value is the outcome.
+    kFinished = 1,   ///< The engine's worker has nothing more to say.
     kProgress = 2,   ///< The engine's progress event; the value is in hundredths of a percent.
     kWriterNews = 3, ///< The media writer told something; see Conversion.
     kStop = 4,       ///< The user wants the conversion to end; the value is a signal, or 0 for the key.

@@ -30,7 +30,10 @@ InputFile::InputFile(const std::string& path)
     const auto seek = [](void* self, int64_t offset, int whence) {
         return static_cast<const InputFile*>(self)->Seek(offset, whence);
     };
-    io_.reset(avio_alloc_context(buffer, kBufferBytes, 0, this, read, nullptr, regular ? +seek : nullptr));
+    if (buffer != nullptr) {
+        io_.reset(
+            avio_alloc_context(buffer, kBufferBytes, 0, this, read, nullptr, regular ? +seek : nullptr));
+    }
     if (!io_) {
         av_free(buffer);
         throw std::bad_alloc();

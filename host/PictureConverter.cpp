@@ -1,21 +1,22 @@
 #include "host/PictureConverter.h"
 
 #include <cstddef>
+#include <new>
 #include <utility>
 
 namespace host {
 namespace {
 
 av::Frame NewPicture(int width, int height) {
-    av::Frame picture(av_frame_alloc());
-    if (!picture) {
-        return nullptr;
-    }
+    av::Frame picture = av::NewFrame();
     picture->format = AV_PIX_FMT_YUV420P;
     picture->width = width;
     picture->height = height;
     picture->color_range = AVCOL_RANGE_MPEG;
-    return av_frame_get_buffer(picture.get(), 0) < 0 ? nullptr : std::move(picture);
+    if (av_frame_get_buffer(picture.get(), 0) < 0) {
+        throw std::bad_alloc();
+    }
+    return picture;
 }
 
 bool IsFullRange(const AVFrame& picture) {
@@ -63,10 +64,8 @@ void CopyPlane(const Walk& walk, uint8_t* target, ptrdiff_t pitch, int width, in
 av::Frame PictureConverter::Convert(AVFrame& picture) {
     av::Frame converted;
     if (picture.format == AV_PIX_FMT_YUV420P && !IsFullRange(picture)) {
-        converted.reset(av_frame_alloc());
-        if (converted) {
-            av_frame_move_ref(converted.get(), &picture);
-        }
+        converted = av::NewFrame();
+        av_frame_move_ref(converted.get(), &picture);
     } else {
         converted = Scale(picture);
     }
@@ -80,7 +79,7 @@ av::Frame PictureConverter::Scale(const AVFrame& picture) {
                                        picture.width, picture.height, AV_PIX_FMT_YUV420P,
                                        SWS_BICUBIC | SWS_ACCURATE_RND, nullptr, nullptr, nullptr));
     av::Frame converted = NewPicture(picture.width, picture.height);
-    if (!scaler_ || !converted) {
+    if (!scaler_) {
         return nullptr;
     }
     const int* coefficients = sws_getCoefficients(picture.colorspace);
@@ -96,9 +95,6 @@ av::Frame PictureConverter::Turn(const AVFrame& picture) const {
     const int width = onSide ? picture.height : picture.width;
     const int height = onSide ? picture.width : picture.height;
     av::Frame turned = NewPicture(width, height);
-    if (!turned) {
-        return nullptr;
-    }
     for (int plane = 0; plane < 3; ++plane) {
         const int shift = plane == 0 ? 0 : 1;
         const auto part = [&](int size) { return (size + shift) >> shift; };

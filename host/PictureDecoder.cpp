@@ -129,10 +129,7 @@ bool PictureDecoder::Accept(AVFrame& frame) {
         held_.reset();
         return false;
     }
-    held_.reset(av_frame_alloc());
-    if (!held_) {
-        return false;
-    }
+    held_ = av::NewFrame();
     av_frame_move_ref(held_.get(), &frame);
     return true;
 }
@@ -169,6 +166,10 @@ void PictureDecoder::ConsiderMoreThreads(av::Packet packet) {
     if (!trial_) {
         return;
     }
+    if (!packet) { // no memory for its copy: the decoder stays as it is
+        trial_.reset();
+        return;
+    }
     trial_->push_back(std::move(packet));
     const int judged = pushed_ - kWarmUpPictures;
     if (judged < kTrialPictures && trial_->size() < kTrialPackets) {
@@ -188,7 +189,7 @@ void PictureDecoder::UseMoreThreads() {
     decoder_ = std::make_unique<StreamDecoder>(*stream_, threads_);
     skip_ = decoded_;
     for (const av::Packet& packet : *trial_) {
-        if (!packet || !decoder_->Decode(packet.get(), [this](AVFrame& frame) { return Accept(frame); })) {
+        if (!decoder_->Decode(packet.get(), [this](AVFrame& frame) { return Accept(frame); })) {
             return;
         }
     }

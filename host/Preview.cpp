@@ -9,6 +9,7 @@
 #include <cstring>
 #include <fmt/format.h>
 #include <memory>
+#include <new>
 #include <utility>
 
 namespace host {
@@ -30,7 +31,7 @@ void CopyPlane(std::vector<uint8_t>& target, const uint8_t* plane, int pitch, st
 
 /// Blue, green, red, 255, top row first, to the red, green, blue that PNG wants.
 av::Frame ToRgb(const std::vector<uint8_t>& bgra, int width, int height) {
-    av::Frame frame(av_frame_alloc());
+    av::Frame frame = av::NewFrame();
     frame->format = AV_PIX_FMT_RGB24;
     frame->width = width;
     frame->height = height;
@@ -52,8 +53,8 @@ av::Frame ToRgb(const std::vector<uint8_t>& bgra, int width, int height) {
 av::Packet EncodePng(const AVFrame& frame) {
     const AVCodec* codec = avcodec_find_encoder(AV_CODEC_ID_PNG);
     const av::CodecContext context(codec != nullptr ? avcodec_alloc_context3(codec) : nullptr);
-    av::Packet packet(av_packet_alloc());
-    if (!context || !packet) {
+    av::Packet packet = av::NewPacket();
+    if (!context) {
         return nullptr;
     }
     context->width = frame.width;
@@ -91,15 +92,16 @@ std::string ReplaceFile(const std::string& path, const AVPacket& content) {
 Preview::Preview(std::string path) : path_(std::move(path)), thread_(&Preview::Run, this) {}
 
 Preview::~Preview() {
-    Finish();
+    Join();
 }
 
-void Preview::Offer(const VideoImage& image) {
+void Preview::Offer(const VideoImage& image) noexcept {
     if (image.nWidth <= 0 || image.nHeight <= 0) {
         return;
     }
-    {
+    try {
         const std::lock_guard lock(mutex_);
+        fresh_ = false;
         latest_.width = image.nWidth;
         latest_.height = image.nHeight;
         latest_.planes.clear();
@@ -109,11 +111,13 @@ void Preview::Offer(const VideoImage& image) {
         CopyPlane(latest_.planes, image.pU, image.nPitchU, Half(image.nWidth), Half(image.nHeight));
         CopyPlane(latest_.planes, image.pV, image.nPitchV, Half(image.nWidth), Half(image.nHeight));
         fresh_ = true;
+    } catch (const std::bad_alloc&) {
+        return;
     }
     changed_.notify_all();
 }
 
-std::string Preview::Finish() {
+void Preview::Join() {
     {
         const std::lock_guard lock(mutex_);
         finishing_ = true;
@@ -122,10 +126,15 @@ std::string Preview::Finish() {
     if (thread_.joinable()) {
         thread_.join();
     }
-    return failure_;
+}
+
+std::string Preview::Finish() {
+    Join();
+    return failure_.empty() ? failure_ : fmt::format("cannot write the preview \"{}\": {}", path_, failure_);
 }
 
 void Preview::Run() {
+    Picture picture;
     std::unique_lock lock(mutex_);
     for (;;) {
         changed_.wait(lock, [&] { return fresh_ || finishing_; });
@@ -133,9 +142,13 @@ void Preview::Run() {
             return;
         }
         fresh_ = false;
-        Picture picture = latest_;
+        std::swap(picture, latest_);
         lock.unlock();
-        Write(picture);
+        try {
+            Write(picture);
+        } catch (const std::bad_alloc&) {
+            failure_ = "no memory"; // short enough to need none
+        }
         lock.lock();
         changed_.wait_for(lock, kInterval, [&] { return finishing_; });
     }
@@ -159,9 +172,9 @@ void Preview::Write(Picture& picture) {
 
     const av::Frame rgb = ToRgb(bgra, picture.width, picture.height);
     const av::Packet png = rgb ? EncodePng(*rgb) : nullptr;
-    const std::string reason = png ? ReplaceFile(path_, *png) : "the picture could not be encoded";
-    if (!reason.empty() && failure_.empty()) {
-        failure_ = fmt::format("cannot write the preview \"{}\": {}", path_, reason);
+    std::string reason = png ? ReplaceFile(path_, *png) : "the picture could not be encoded";
+    if (failure_.empty()) {
+        failure_ = std::move(reason);
     }
 }
 

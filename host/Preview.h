@@ -22,8 +22,8 @@ public:
     Preview& operator=(const Preview&) = delete;
     ~Preview();
 
-    /// Copies a planar 4:2:0 picture and returns. Any one thread.
-    void Offer(const VideoImage& image);
+    /// Copies a planar 4:2:0 picture and returns; without memory it is not shown. Any one thread.
+    void Offer(const VideoImage& image) noexcept;
 
     /// Waits until the last picture is written. What went wrong first; empty when nothing did.
     std::string Finish();
@@ -36,6 +36,7 @@ private:
     };
 
     void Run();
+    void Join();
     void Write(Picture& picture);
 
     const std::string path_;

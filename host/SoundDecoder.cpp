@@ -43,7 +43,7 @@ SoundDecoder::SoundDecoder(const Source& source, Demuxer& demuxer)
       demuxer_(demuxer),
       stream_(source.SoundStream()),
       decoder_(*stream_, 1),
-      inputForm_(av_frame_alloc()),
+      inputForm_(av::NewFrame()),
       queue_(1 << 12,
              static_cast<std::size_t>(source.Info().sound->sampleRate) *
                  static_cast<std::size_t>(source.Info().sound->channels) * 4,
@@ -55,9 +55,6 @@ SoundDecoder::SoundDecoder(const Source& source, Demuxer& demuxer)
     info_.format = {sound.sampleRate, sound.channels, sound.bitsPerSample,
                     static_cast<int32_t>(sound.sampleRate * frameBytes_), sound.duration};
     CopyLayout(*outputLayout_.Get(), stream_->codecpar->ch_layout);
-    if (!inputForm_) {
-        throw std::bad_alloc();
-    }
 }
 
 SoundDecoder::~SoundDecoder() {
@@ -160,15 +157,18 @@ bool SoundDecoder::FitResampler(const AVFrame& frame) {
     inputForm_->sample_rate = frame.sample_rate;
     CopyLayout(inputForm_->ch_layout, frame.ch_layout);
     SwrContext* resampler = resampler_.release();
-    const int result = swr_alloc_set_opts2(
+    int result = swr_alloc_set_opts2(
         &resampler, outputLayout_.Get(), OutputFormat(*source_.Info().sound), info_.format.nSampleRate,
         &inputForm_->ch_layout, static_cast<AVSampleFormat>(frame.format), frame.sample_rate, 0, nullptr);
     resampler_.reset(resampler);
-    if (result < 0 || swr_init(resampler_.get()) < 0) {
-        resampler_.reset();
-        return false;
+    if (result >= 0) {
+        result = swr_init(resampler_.get());
     }
-    return true;
+    if (result < 0) {
+        resampler_.reset();
+        av::CheckMemory(result);
+    }
+    return result >= 0;
 }
 
 /// The frame's samples in the engine's form; without a frame, what the resampler still holds.
@@ -182,6 +182,7 @@ SoundDecoder::Chunk SoundDecoder::Resample(const AVFrame* frame) {
     uint8_t* output = chunk.data();
     const auto** input = frame != nullptr ? const_cast<const uint8_t**>(frame->extended_data) : nullptr;
     const int samples = swr_convert(resampler_.get(), &output, room, input, inputSamples);
+    av::CheckMemory(samples);
     chunk.resize(static_cast<std::size_t>(std::max(samples, 0) * frameBytes_));
     return chunk;
 }

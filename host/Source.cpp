@@ -102,14 +102,16 @@ void Source::Open(const std::string& path) {
         throw SourceError(CannotOpen(path, error.code().message()));
     }
     info_.bytes = file_->Size();
+    // The prefix keeps a colon in the name from being read as a protocol.
+    const std::string url = "file:" + path;
     AVFormatContext* context = avformat_alloc_context();
     if (context == nullptr) {
         throw std::bad_alloc();
     }
     context->pb = file_->Io();
     context->interrupt_callback = {WasInterrupted, file_.get()}; // for files that the source names
-    // The prefix keeps a colon in the name from being read as a protocol.
-    const int result = avformat_open_input(&context, ("file:" + path).c_str(), nullptr, nullptr);
+    const int result = avformat_open_input(&context, url.c_str(), nullptr, nullptr);
+    av::CheckMemory(result);
     if (result < 0) {
         const std::string hint =
             result == AVERROR_INVALIDDATA
@@ -118,7 +120,9 @@ void Source::Open(const std::string& path) {
         throw SourceError(CannotOpen(path, hint));
     }
     input_.reset(context);
-    if (const int found = avformat_find_stream_info(context, nullptr); found < 0) {
+    const int found = avformat_find_stream_info(context, nullptr);
+    av::CheckMemory(found);
+    if (found < 0) {
         throw SourceError("cannot read the streams of \"" + path + "\": " + av::ErrorText(found));
     }
     if (context->start_time != AV_NOPTS_VALUE) {
@@ -243,7 +247,7 @@ double Source::LastStampSeconds() {
         byBytes ? avformat_seek_file(input_.get(), -1, INT64_MIN, target, INT64_MAX, AVSEEK_FLAG_BYTE)
                 : avformat_seek_file(input_.get(), -1, INT64_MIN, INT64_MAX / 2, INT64_MAX, 0);
     double last = 0;
-    const av::Packet packet(av_packet_alloc());
+    const av::Packet packet = av::NewPacket();
     while (sought >= 0 && av_read_frame(input_.get(), packet.get()) >= 0) {
         const AVStream* stream = input_->streams[packet->stream_index];
         const int64_t stamp = packet->pts != AV_NOPTS_VALUE ? packet->pts : packet->dts;

@@ -13,6 +13,7 @@ extern "C" {
 #include <cstring>
 #include <fcntl.h>
 #include <fmt/format.h>
+#include <new>
 #include <sys/ioctl.h>
 #include <unistd.h>
 
@@ -27,7 +28,10 @@ void LogFfmpeg(void* source, int level, const char* format, va_list arguments) {
     static thread_local int prefix = 1;
     char line[1024];
     av_log_format_line2(source, level, format, arguments, line, sizeof line, &prefix);
-    ::Log(text::FromUtf8(line).c_str());
+    try {
+        ::Log(text::FromUtf8(line).c_str());
+    } catch (const std::bad_alloc&) { // the line is lost; FFmpeg's threads know no exceptions
+    }
 }
 
 } // namespace

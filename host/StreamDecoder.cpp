@@ -4,17 +4,19 @@
 
 namespace host {
 
-StreamDecoder::StreamDecoder(const AVStream& stream, int threads) : frame_(av_frame_alloc()) {
+StreamDecoder::StreamDecoder(const AVStream& stream, int threads) : frame_(av::NewFrame()) {
     const AVCodec* codec = avcodec_find_decoder(stream.codecpar->codec_id);
     context_.reset(avcodec_alloc_context3(codec));
-    if (!context_ || !frame_) {
+    if (!context_) {
         throw std::bad_alloc();
     }
-    avcodec_parameters_to_context(context_.get(), stream.codecpar);
+    av::CheckMemory(avcodec_parameters_to_context(context_.get(), stream.codecpar));
     context_->pkt_timebase = stream.time_base;
     context_->thread_count = threads;
     context_->thread_type = FF_THREAD_FRAME | FF_THREAD_SLICE;
-    if (const int result = avcodec_open2(context_.get(), codec, nullptr); result < 0) {
+    const int result = avcodec_open2(context_.get(), codec, nullptr);
+    av::CheckMemory(result);
+    if (result < 0) {
         throw SourceError(std::string("cannot start the decoder ") +
                           avcodec_get_name(stream.codecpar->codec_id) + ": " + av::ErrorText(result));
     }
@@ -28,6 +30,7 @@ bool StreamDecoder::Decode(const AVPacket* packet, const Sink& sink) {
         }
         result = avcodec_send_packet(context_.get(), packet);
     }
+    av::CheckMemory(result);
     if (result < 0 && result != AVERROR_EOF) {
         ++damaged_;
     }
@@ -44,6 +47,7 @@ bool StreamDecoder::Receive(const Sink& sink) {
         if (result == AVERROR_EOF) {
             return false;
         }
+        av::CheckMemory(result);
         if (result < 0) {
             ++damaged_;
             return true;

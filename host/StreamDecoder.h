@@ -18,7 +18,8 @@ public:
     StreamDecoder(const AVStream& stream, int threads);
 
     /// Decodes one packet, or the rest when `packet` is null, and hands every frame to `sink`. Damaged data
-    /// is skipped and counted. False when the sink ended it or everything has been decoded.
+    /// is skipped and counted. False when the sink ended it or everything has been decoded. Throws
+    /// std::bad_alloc.
     bool Decode(const AVPacket* packet, const Sink& sink);
 
     /// Packets and frames that were damaged.

@@ -6,7 +6,9 @@
 #include <cerrno>
 #include <chrono>
 #include <memory>
+#include <new>
 #include <unistd.h>
+#include <utility>
 
 namespace host {
 namespace {
@@ -39,6 +41,9 @@ WriterWatch::~WriterWatch() {
 
 std::optional<WriterWatch::News> WriterWatch::Take() {
     const std::lock_guard lock(mutex_);
+    if (std::exchange(newsLost_, false)) {
+        throw std::bad_alloc();
+    }
     if (news_.empty()) {
         return std::nullopt;
     }
@@ -78,7 +83,11 @@ void WriterWatch::OnEvent(void* context, int event, const WriterStatus* status) 
     auto* watch = static_cast<WriterWatch*>(context);
     {
         const std::lock_guard lock(watch->mutex_);
-        watch->news_.push_back({event, *status});
+        try {
+            watch->news_.push_back({event, *status});
+        } catch (const std::bad_alloc&) {
+            watch->newsLost_ = true;
+        }
     }
     if (event == kWriterEventClosed) {
         watch->closedBytes_ += status->llBytesWritten;
@@ -87,7 +96,11 @@ void WriterWatch::OnEvent(void* context, int event, const WriterStatus* status) 
 }
 
 int WriterWatch::OnFullDisk(void* context, const WriterStatus* status) {
-    return static_cast<WriterWatch*>(context)->WaitForRoom(*status);
+    try {
+        return static_cast<WriterWatch*>(context)->WaitForRoom(*status);
+    } catch (const std::bad_alloc&) {
+        return 0;
+    }
 }
 
 /// Nothing announces free space, so it is asked for every second.

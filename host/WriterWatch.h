@@ -28,7 +28,7 @@ public:
     WriterWatch(const WriterWatch&) = delete;
     WriterWatch& operator=(const WriterWatch&) = delete;
 
-    /// The oldest news that was not taken yet.
+    /// The oldest news that was not taken yet. Throws std::bad_alloc once when there was no memory for some.
     std::optional<News> Take();
 
     /// Whether the writer waits for room on a full disk.
@@ -51,6 +51,7 @@ private:
     mutable std::mutex mutex_;
     std::condition_variable changed_;
     std::deque<News> news_;
+    bool newsLost_ = false;
     bool givenUp_ = false;
     std::atomic<bool> waiting_{false};
     std::atomic<int64_t> closedBytes_{0};

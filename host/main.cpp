@@ -12,6 +12,7 @@
 #include <exception>
 #include <fmt/format.h>
 #include <malloc.h>
+#include <new>
 
 namespace host {
 namespace {
@@ -80,6 +81,9 @@ int main(int argc, char** argv) {
     } catch (const host::Failure& failure) {
         std::fprintf(stderr, "movieconv: error: %s\n", failure.what());
         return static_cast<int>(failure.Code());
+    } catch (const std::bad_alloc&) {
+        std::fputs("movieconv: error: there is not enough memory\n", stderr);
+        return static_cast<int>(host::ExitCode::kInternal);
     } catch (const std::exception& error) {
         std::fprintf(stderr, "movieconv: internal error: %s\n", error.what());
         return static_cast<int>(host::ExitCode::kInternal);

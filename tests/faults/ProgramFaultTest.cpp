@@ -1,6 +1,7 @@
 // What befalls a conversion from outside: the input is cut or removed, the output's folder goes, threads
 // cannot be started, the log cannot be written. The program tells it by its exit code and leaves no half file
 // under a real name.
+#include "tests/faults/CrashReport.h"
 #include "tests/host/Inspect.h"
 #include "tests/host/Program.h"
 #include "tests/host/TestMovies.h"
@@ -12,6 +13,7 @@
 #include <filesystem>
 #include <fstream>
 #include <iterator>
+#include <set>
 #include <sys/stat.h>
 #include <thread>
 
@@ -121,25 +123,68 @@ TEST(LogFault, AStallIsNamed) {
 }
 
 #ifdef MOVIECONV_FAILING_THREADS
+/// Converts with what `variable` names failing by means of the preloaded `library`.
+Result CallFailing(const char* library, const char* variable, const std::string& failing,
+                   const Args& arguments) {
+    setenv(variable, failing.c_str(), 1);
+    setenv("LD_PRELOAD", library, 1);
+    Result result = Call(arguments);
+    unsetenv("LD_PRELOAD");
+    return result;
+}
+
 // The threads of the program, the engine, the decoders and the writer, in the order of their start. The first
-// run in which all start ends the loop.
+// run in which all start ends the loop. An encoder that gets none of its own is refused.
 TEST(ThreadFault, EveryThreadThatCannotBeStartedIsTold) {
     const std::string source = Make("short.mkv", Join(CountedPictures(1), Beeps(1), Args{"-c:v", "mpeg4"}));
-    for (int number = 1;; ++number) {
-        SCOPED_TRACE(number);
-        const Folder folder;
-        setenv("MOVIECONV_FAILING_THREAD", std::to_string(number).c_str(), 1);
-        setenv("LD_PRELOAD", MOVIECONV_FAILING_THREADS, 1);
-        const Result result = Call({source, folder / "out.mp4", "--preview", folder / "now.png"});
-        unsetenv("LD_PRELOAD");
-        if (result.code == 0) {
-            EXPECT_EQ(PicturesIn(folder / "out.mp4"), 25u);
-            EXPECT_GE(number, 9) << "keys, preview, worker, decoders, reading, encoders";
-            return;
+    for (const std::string codec : {"XVID", "H264"}) {
+        std::set<int> codes;
+        for (int number = 1; codes.count(0) == 0; ++number) {
+            SCOPED_TRACE(codec + std::to_string(number));
+            const Folder folder;
+            const Result result = CallFailing(
+                MOVIECONV_FAILING_THREADS, "MOVIECONV_FAILING_THREAD", std::to_string(number),
+                {source, folder / "out.mp4", "--preview", folder / "now.png", "--video-codec", codec});
+            codes.insert(result.code);
+            EXPECT_EQ(result.err.empty(), result.code == 0);
+            if (result.code == 0) {
+                EXPECT_EQ(PicturesIn(folder / "out.mp4"), 25u);
+                EXPECT_GE(number, 9) << "keys, preview, worker, decoders, reading, encoders";
+            } else {
+                EXPECT_TRUE(result.code == 3 || !fs::exists(folder / "out.mp4")) << result.err;
+            }
+            EXPECT_TRUE(result.code != 2 || result.err.find("encoder for \"H264\"") != std::string::npos);
         }
-        EXPECT_TRUE(result.code == 1 || result.code == 3) << result.code;
-        EXPECT_NE(result.err, "");
-        EXPECT_TRUE(result.code == 3 || !fs::exists(folder / "out.mp4")) << result.err;
+        const bool parallel = codec == "H264" && std::thread::hardware_concurrency() > 1;
+        EXPECT_EQ(codes, parallel ? (std::set<int>{0, 1, 2, 3}) : (std::set<int>{0, 1, 3}));
+    }
+}
+
+// Allocations of the whole program, some of them once and some for good. What has the real name plays, to the
+// end where nothing was said.
+TEST(MemoryFault, ALackOfItIsTold) {
+    constexpr int kStep = 211;
+    const std::string source = Make("short.mp4", Join(CountedPictures(1), Beeps(1), Args{"-c:v", "mpeg4"}));
+    for (const std::string lack : {"", "-"}) {
+        Result result{};
+        for (int number = 1; result.err.find("No allocation") == std::string::npos; number += kStep) {
+            SCOPED_TRACE(std::to_string(number) + lack);
+            const Folder folder;
+            const std::string output = folder / "out.mp4";
+            result =
+                CallFailing(MOVIECONV_FAILING_ALLOCATIONS, "MOVIECONV_FAILING_ALLOCATION",
+                            std::to_string(number) + lack, {source, output, "--preview", folder / "now.png"});
+            if (IsKnownCrash(result.err)) {
+                continue;
+            }
+            const bool told = result.err.find("movieconv: ") != std::string::npos;
+            EXPECT_TRUE(result.code >= 0 && result.code <= 4) << result.code << result.err;
+            EXPECT_TRUE(told || result.code == 0) << result.code << result.err;
+            EXPECT_TRUE(fs::exists(output) || result.code != 0) << result.err;
+            if (fs::exists(output) && result.code != 3) { // which may have read nothing
+                EXPECT_TRUE(WasOpening(result.err) || told || PicturesIn(output) == 25) << result.err;
+            }
+        }
     }
 }
 #endif
