@@ -3,6 +3,7 @@
 #include "fuzz/Fuzz.h"
 #include "media/FourCC.h"
 #include "media/MediaWriter.h"
+#include "tests/support/Folder.h"
 #include "tests/writer/TestSource.h"
 #include "text/Utf8.h"
 #include "writer/WriterStatus.h"
@@ -199,7 +200,7 @@ void WriteRecords(FuzzedDataProvider& input, void* file) {
 } // namespace
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
-    static const TemporaryFolder folder;
+    static const Folder folder;
     FuzzedDataProvider input(data, size);
     const WriterOptions options = MakeOptions(input);
     MWSetWriterOptions(&options);
@@ -209,7 +210,7 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
                             WildInteger(input, 32000), 1.0};
     const bool hasVideo = input.ConsumeIntegralInRange(0, 7) != 0;
     const bool hasAudio = input.ConsumeIntegralInRange(0, 7) != 0;
-    const std::string target = folder.Path("movie");
+    const std::string target = folder / "movie";
 
     void* file = MWCreateMediaFile(text::FromUtf8(target).c_str(), &param, hasVideo ? &video : nullptr,
                                    hasAudio ? &audio : nullptr);

@@ -1,12 +1,10 @@
 // Disks that fail: at every write, at the sync, at the rename. Nothing is presented as complete, what was
 // written can be played, and nobody waits for ever.
 #include "MovieReader.h"
-#include "TestSource.h"
-#include "text/Utf8.h"
+#include "tests/support/Folder.h"
 #include "writer/MediaFile.h"
 #include "writer/OutputFile.h"
 #include "writer/StatusBoard.h"
-#include "writer/WriterStatus.h"
 
 #include <gtest/gtest.h>
 
@@ -14,15 +12,12 @@
 #include <cerrno>
 #include <cstring>
 #include <filesystem>
-#include <fstream>
 #include <iterator>
 #include <memory>
 #include <string>
 #include <thread>
 #include <utility>
 #include <vector>
-
-#include <sys/stat.h>
 
 namespace {
 
@@ -136,15 +131,10 @@ protected:
         EXPECT_LT(read.pictures.size(), 101U);
     }
 
-    TemporaryFolder folder_;
-    std::string path_ = folder_.Path("movie");
+    Folder folder_;
+    std::string path_ = folder_ / "movie";
     TestMovie movie_;
 };
-
-std::string Content(const std::string& path) {
-    std::ifstream file(path, std::ios::binary);
-    return {std::istreambuf_iterator<char>(file), {}};
-}
 
 struct Disk {
     const char* name;
@@ -157,9 +147,9 @@ class FaultIn : public Fault, public testing::WithParamInterface<Disk> {};
 TEST_P(FaultIn, EveryWriteIsToldAndLeavesAPlayablePart) {
     movie_.param.fccFileFormat = GetParam().format;
     movie_.param.fccAudio = FourCC("MP3 ");
-    const std::string earlier = folder_.Path("earlier");
+    const std::string earlier = folder_ / "earlier";
     ASSERT_TRUE(movie_.Write(earlier));
-    const std::string earlierContent = Content(earlier);
+    const std::string earlierContent = ReadFile(earlier);
     const int writes = CountWrites();
     ASSERT_GT(writes, 1);
     for (int number = 0; number < writes; ++number) {
@@ -168,7 +158,7 @@ TEST_P(FaultIn, EveryWriteIsToldAndLeavesAPlayablePart) {
         faults.failingWrite = number;
         faults.writeError = GetParam().error;
         const Outcome outcome = Run(faults);
-        EXPECT_TRUE(Content(earlier) == earlierContent);
+        EXPECT_TRUE(ReadFile(earlier) == earlierContent);
         if (outcome.complete) {
             // The data was whole in the temporary file, only its tidier form found no room.
             EXPECT_EQ(ReadMovieFile(path_).pictures.size(), 100U);
@@ -301,7 +291,7 @@ TEST_F(Fault, NeitherFilesNorThreadsAreLeftBehind) {
             faults.failingWrite = failing;
             Run(faults);
         }
-        MWCloseMediaFile(movie_.Create(folder_.Path("no/such/folder/movie")), nullptr, nullptr);
+        MWCloseMediaFile(movie_.Create(folder_ / "no/such/folder/movie"), nullptr, nullptr);
     };
     run_all();
     const size_t descriptors = CountEntries("/proc/self/fd");

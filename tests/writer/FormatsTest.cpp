@@ -1,13 +1,9 @@
 // Every format with every codec that the table says it carries: written, then read back and decoded.
 #include "MovieReader.h"
-#include "TestSource.h"
 #include "writer/FormatTable.h"
-#include "writer/WriterStatus.h"
 
 #include <gtest/gtest.h>
 
-#include <algorithm>
-#include <cmath>
 #include <string>
 #include <vector>
 
@@ -45,75 +41,58 @@ std::vector<Pair> AllPairs() {
     return pairs;
 }
 
-/// Seconds at which the sound is no longer silent.
-double ToneBegins(const ReadMovie& read) {
-    const auto loud = std::find_if(read.firstChannel.begin(), read.firstChannel.end(),
-                                   [](float sample) { return std::abs(sample) > 0.2F; });
-    return read.audioStart + static_cast<double>(loud - read.firstChannel.begin()) / read.sampleRate;
-}
+class Formats : public testing::TestWithParam<Pair> {
+protected:
+    Formats() {
+        movie_.pictures = 30;
+        movie_.soundSeconds = 1.2;
+        movie_.quietSeconds = 0.4;
+        movie_.param.fccFileFormat = GetParam().format;
+        movie_.param.fccVideo = GetParam().video;
+        movie_.param.fccAudio = GetParam().audio;
+        movie_.hasVideo = GetParam().video != 0;
+    }
 
-class Formats : public testing::TestWithParam<Pair> {};
+    TestMovie movie_;
+};
 
 TEST_P(Formats, AreReadBackComplete) {
-    const Pair pair = GetParam();
-    const TemporaryFolder folder;
-    TestMovie movie;
-    movie.pictures = 30;
-    movie.soundSeconds = 1.2;
-    movie.quietSeconds = 0.4;
-    movie.param.fccFileFormat = pair.format;
-    movie.param.fccVideo = pair.video;
-    movie.param.fccAudio = pair.audio;
-    movie.hasVideo = pair.video != 0;
-    const std::string path = folder.Path("movie");
-    WriterStatus status{};
-    ASSERT_TRUE(movie.Write(path)) << (MWGetLastFailure(&status), status.szWhat);
-    EXPECT_EQ(folder.Names(), std::vector<std::string>{"movie"});
-
-    const writer::Container* container = writer::FindContainer(pair.format);
-    const writer::AudioCodec* audio = writer::FindAudioCodec(*container, pair.audio);
-    const ReadMovie read = ReadMovieFile(path);
+    const ReadMovie read = WriteAndRead(movie_);
+    const writer::Container* container = writer::FindContainer(GetParam().format);
     EXPECT_TRUE(read.readable);
     EXPECT_EQ(read.audioStreams, 1);
-    EXPECT_EQ(read.audioCodec, audio->id);
+    EXPECT_EQ(read.audioCodec, writer::FindAudioCodec(*container, GetParam().audio)->id);
     EXPECT_EQ(read.channels, 2);
     // The decoder may hear the run-up and the padding of the codec's frames, nothing else.
     const double heard = static_cast<double>(read.samples) / read.sampleRate;
     EXPECT_NEAR(heard, 1.2, 0.09);
     EXPECT_GE(heard, 1.2 - 0.0001);
-    if (movie.hasVideo) {
-        const writer::VideoCodec* video = writer::FindVideoCodec(*container, pair.video);
+    if (movie_.hasVideo) {
         EXPECT_EQ(read.videoStreams, 1);
-        EXPECT_EQ(read.videoCodec, video->id);
+        EXPECT_EQ(read.videoCodec, writer::FindVideoCodec(*container, GetParam().video)->id);
         ASSERT_EQ(read.pictures.size(), 30U);
         const double start = read.pictures.front().time;
         for (size_t i = 0; i < read.pictures.size(); ++i)
             ASSERT_NEAR(read.pictures[i].time - start, static_cast<double>(i) / 25.0, 0.0011) << i;
         EXPECT_NEAR(read.audioStart, start, 0.04);
-        EXPECT_NEAR(ToneBegins(read) - start, movie.quietSeconds, 0.01);
+        EXPECT_NEAR(read.ToneBegins() - start, movie_.quietSeconds, 0.01);
         EXPECT_NEAR(read.duration, 1.2, 0.1);
     }
 
-    ASSERT_EQ(MWGetFileStatus(MWGetFileCount(), &status), 1);
+    const WriterStatus status = Latest();
     EXPECT_EQ(status.nState, kWriterFileComplete);
     EXPECT_NEAR(status.dAudioWritten, 1.2, 0.0001);
-    EXPECT_NEAR(status.dVideoWritten, movie.hasVideo ? 1.2 : 0.0, 0.0001);
-    EXPECT_EQ(status.llPicturesWritten, movie.hasVideo ? 30 : 0);
+    EXPECT_NEAR(status.dVideoWritten, movie_.hasVideo ? 1.2 : 0.0, 0.0001);
+    EXPECT_EQ(status.llPicturesWritten, movie_.hasVideo ? 30 : 0);
 }
 
 // A source can announce sound and have none.
 TEST_P(Formats, KeepPicturesWithoutSound) {
-    const TemporaryFolder folder;
-    TestMovie movie;
-    movie.pictures = 5;
-    movie.soundSeconds = 0;
-    movie.param.fccFileFormat = GetParam().format;
-    movie.param.fccVideo = GetParam().video;
-    movie.param.fccAudio = GetParam().audio;
-    if (GetParam().video == 0)
+    movie_.pictures = 5;
+    movie_.soundSeconds = 0;
+    if (!movie_.hasVideo)
         GTEST_SKIP() << "carries no pictures";
-    ASSERT_TRUE(movie.Write(folder.Path("movie")));
-    const ReadMovie read = ReadMovieFile(folder.Path("movie"));
+    const ReadMovie read = WriteAndRead(movie_);
     EXPECT_TRUE(read.readable);
     EXPECT_EQ(read.pictures.size(), 5U);
 }

@@ -4,6 +4,7 @@
 #include "TestSource.h"
 #include "tests/engine/CountingAllocator.h"
 #include "tests/faults/CrashReport.h"
+#include "tests/support/Folder.h"
 #include "text/Utf8.h"
 #include "writer/WriterStatus.h"
 
@@ -96,8 +97,8 @@ public:
 
     bool created = false;
     bool complete = false;
-    TemporaryFolder folder;
-    const std::string path = folder.Path("movie");
+    Folder folder;
+    const std::string path = folder / "movie";
 
 private:
     static constexpr int kSamples = 1764;
@@ -153,7 +154,7 @@ int Attempt(const Case& what, int64_t number, const ReadMovie& whole) {
         EXPECT_STRNE(status.szWhat, "");
         EXPECT_EQ(names,
                   writing.created ? std::vector<std::string>{"movie.part"} : std::vector<std::string>{});
-        const ReadMovie part = ReadMovieFile(writing.folder.Path("movie.part"));
+        const ReadMovie part = ReadMovieFile(writing.folder / "movie.part");
         EXPECT_TRUE(part.readable || part.pictures.empty());
     }
     if (testing::Test::HasFailure())

@@ -1,11 +1,15 @@
 #include "MovieReader.h"
+#include "tests/support/Folder.h"
+
+#include <gtest/gtest.h>
 
 extern "C" {
 #include <libavutil/imgutils.h>
 }
 
+#include <algorithm>
+#include <cmath>
 #include <cstring>
-#include <functional>
 #include <map>
 
 namespace {
@@ -128,4 +132,25 @@ ReadMovie ReadMovieFile(const std::string& path) {
     for (const auto& entry : decoders)
         decode(entry.first, nullptr);
     return movie;
+}
+
+double ReadMovie::ToneBegins() const {
+    const auto loud = std::find_if(firstChannel.begin(), firstChannel.end(),
+                                   [](float sample) { return std::abs(sample) > 0.2F; });
+    return audioStart + static_cast<double>(loud - firstChannel.begin()) / sampleRate;
+}
+
+ReadMovie WriteAndRead(const TestMovie& movie, const std::function<void(void* file)>& write) {
+    const Folder folder;
+    void* file = movie.Create(folder / "movie");
+    write ? write(file) : movie.WriteAll(file);
+    EXPECT_EQ(MWCloseMediaFile(file, nullptr, nullptr), 1) << Latest().szWhat;
+    EXPECT_EQ(folder.Names(), std::vector<std::string>{"movie"});
+    return ReadMovieFile(folder / "movie");
+}
+
+WriterStatus Latest() {
+    WriterStatus status{};
+    EXPECT_EQ(MWGetFileStatus(MWGetFileCount(), &status), 1);
+    return status;
 }

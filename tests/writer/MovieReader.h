@@ -1,10 +1,13 @@
-// Reads a movie with FFmpeg's libraries and says what is in it.
+// Reads a movie with FFmpeg's libraries, not with the host's decoders, and says what is in it.
 #ifndef MOVIECONV_TESTS_WRITER_MOVIEREADER_H
 #define MOVIECONV_TESTS_WRITER_MOVIEREADER_H
 
+#include "TestSource.h"
 #include "ffmpeg/AvHandles.h"
+#include "writer/WriterStatus.h"
 
 #include <cstdint>
+#include <functional>
 #include <string>
 #include <vector>
 
@@ -37,10 +40,20 @@ struct ReadMovie {
     double audioStart = 0;           ///< Seconds; time of the first sample that is heard.
     int64_t samples = 0;             ///< Sample frames decoded.
     std::vector<float> firstChannel; ///< Decoded samples, -1 to 1.
+
+    /// Seconds at which the sound is no longer silent.
+    double ToneBegins() const;
 };
 
 /// Decodes everything in `path`. `readable` is false when the file cannot be opened or its data ends in
 /// errors.
 ReadMovie ReadMovieFile(const std::string& path);
+
+/// Writes a file with everything in `movie`, or with what `write` writes, and reads it. Fails the test when
+/// the writer does not say that the file is complete.
+ReadMovie WriteAndRead(const TestMovie& movie, const std::function<void(void* file)>& write = nullptr);
+
+/// The status of the file created last.
+WriterStatus Latest();
 
 #endif

@@ -1,42 +1,29 @@
 // Pictures on their way into the file: pitches, sizes, shapes, rates.
 #include "MovieReader.h"
-#include "TestSource.h"
+#include "tests/support/Folder.h"
 #include "writer/PicturePacer.h"
 #include "writer/PictureScaler.h"
-#include "writer/WriterStatus.h"
 
 #include <gtest/gtest.h>
 
 #include <cmath>
-#include <filesystem>
-#include <fstream>
-#include <iterator>
 #include <string>
 #include <thread>
 #include <vector>
 
 namespace {
 
-using writer::FitPicture;
-using writer::PictureFit;
-
-WriterStatus Latest() {
-    WriterStatus status{};
-    EXPECT_EQ(MWGetFileStatus(MWGetFileCount(), &status), 1);
-    return status;
-}
-
-ReadMovie WriteAndRead(const TestMovie& movie) {
-    const TemporaryFolder folder;
-    EXPECT_TRUE(movie.Write(folder.Path("movie")));
-    return ReadMovieFile(folder.Path("movie"));
-}
-
 /// Whether picture `number` of TestPicture is in the picture of the given size.
 void ExpectNumber(const ReadPicture& picture, int number, int width, int height) {
     const int block = width / 10;
     EXPECT_NEAR(picture.At(number % 10 * block + block / 2, height / 4), 220, 25);
     EXPECT_LT(picture.At((number + 5) % 10 * block + block / 2, height / 4), 140);
+}
+
+TestMovie WithoutSound() {
+    TestMovie movie;
+    movie.hasAudio = false;
+    return movie;
 }
 
 TEST(Pictures, EveryOneIsWrittenOnceWithoutItsPadding) {
@@ -51,17 +38,21 @@ TEST(Pictures, EveryOneIsWrittenOnceWithoutItsPadding) {
 }
 
 TEST(Pictures, OddSizesAreKeptOrPaddedByOne) {
-    for (const auto& [codec, format, width, height] :
-         {std::tuple{"XVID", "MP4 ", 161, 121}, std::tuple{"H264", "MP4 ", 162, 122},
-          std::tuple{"HEVC", "MP4 ", 162, 122}, std::tuple{"MJPG", "MKV ", 161, 121},
-          std::tuple{"VP90", "WEBM", 161, 121}}) {
-        TestMovie movie;
+    struct {
+        uint32_t codec, format;
+        int width, height;
+    } const cases[] = {
+        {FourCC("XVID"), FourCC("MP4 "), 161, 121}, {FourCC("H264"), FourCC("MP4 "), 162, 122},
+        {FourCC("HEVC"), FourCC("MP4 "), 162, 122}, {FourCC("MJPG"), FourCC("MKV "), 161, 121},
+        {FourCC("VP90"), FourCC("WEBM"), 161, 121},
+    };
+    for (const auto& [codec, format, width, height] : cases) {
+        TestMovie movie = WithoutSound();
         movie.width = 161;
         movie.height = 121;
         movie.pictures = 5;
-        movie.hasAudio = false;
-        movie.param.fccVideo = FourCC(codec[0], codec[1], codec[2], codec[3]);
-        movie.param.fccFileFormat = FourCC(format[0], format[1], format[2], format[3]);
+        movie.param.fccVideo = codec;
+        movie.param.fccFileFormat = format;
         const ReadMovie read = WriteAndRead(movie);
         ASSERT_EQ(read.pictures.size(), 5U) << codec;
         EXPECT_EQ(read.pictures[0].width, width) << codec;
@@ -88,21 +79,16 @@ TEST(Pictures, AnotherOutputSizeIsBorderedOrStretched) {
 }
 
 TEST(Pictures, ASizeThatChangesOnTheWayIsScaled) {
-    const TemporaryFolder folder;
-    TestMovie movie;
-    movie.hasAudio = false;
-    void* file = movie.Create(folder.Path("movie"));
-    int number = 0;
-    for (const auto& [width, height] :
-         {std::pair{160, 120}, std::pair{320, 240}, std::pair{80, 60}, std::pair{160, 120}}) {
-        TestPicture picture(width, height);
-        for (int i = 0; i < 5; ++i, ++number)
-            EXPECT_EQ(MWWriteVideoFrame(file, &picture.Paint(number, number * 400'000)), 1);
-    }
-    EXPECT_EQ(MWCloseMediaFile(file, nullptr, nullptr), 1);
-    const ReadMovie read = ReadMovieFile(folder.Path("movie"));
+    const ReadMovie read = WriteAndRead(WithoutSound(), [](void* file) {
+        int number = 0;
+        for (const int height : {120, 240, 60, 120}) {
+            TestPicture picture(height * 4 / 3, height);
+            for (int i = 0; i < 5; ++i, ++number)
+                EXPECT_EQ(MWWriteVideoFrame(file, &picture.Paint(number, number * 400'000)), 1);
+        }
+    });
     ASSERT_EQ(read.pictures.size(), 20U);
-    for (number = 0; number < 20; ++number)
+    for (int number = 0; number < 20; ++number)
         ExpectNumber(read.pictures[number], number, 160, 120);
 }
 
@@ -133,16 +119,12 @@ TEST(Pictures, AnotherRateLeavesOutAndRepeats) {
 }
 
 TEST(Pictures, StampsOfAVariableRateAreKept) {
-    const TemporaryFolder folder;
-    TestMovie movie;
-    movie.hasAudio = false;
-    void* file = movie.Create(folder.Path("movie"));
-    TestPicture picture(160, 120);
     const std::vector<int64_t> times{0, 170'000, 400'000, 1'111'000, 1'200'000, 9'000'000, 9'400'000};
-    for (size_t i = 0; i < times.size(); ++i)
-        MWWriteVideoFrame(file, &picture.Paint(static_cast<int>(i), times[i]));
-    EXPECT_EQ(MWCloseMediaFile(file, nullptr, nullptr), 1);
-    const ReadMovie read = ReadMovieFile(folder.Path("movie"));
+    const ReadMovie read = WriteAndRead(WithoutSound(), [&](void* file) {
+        TestPicture picture(160, 120);
+        for (size_t i = 0; i < times.size(); ++i)
+            MWWriteVideoFrame(file, &picture.Paint(static_cast<int>(i), times[i]));
+    });
     ASSERT_EQ(read.pictures.size(), times.size());
     for (size_t i = 0; i < times.size(); ++i)
         EXPECT_NEAR(read.pictures[i].time, static_cast<double>(times[i]) / 1e7, 0.0002);
@@ -152,53 +134,46 @@ TEST(Pictures, TheFileIsTheSameWhateverTheTiming) {
     WriterOptions options{};
     options.bBitExact = 1;
     MWSetWriterOptions(&options);
-    const TemporaryFolder folder;
-    const auto content = [&](const char* name) {
-        std::ifstream in(folder.Path(name), std::ios::binary);
-        return std::string(std::istreambuf_iterator<char>(in), {});
-    };
+    const Folder folder;
     const TestMovie movie;
-    EXPECT_TRUE(movie.Write(folder.Path("swift")));
-    // The same calls with pauses between stretches of pictures and sound.
-    void* file = movie.Create(folder.Path("slow"));
-    TestPicture picture(movie.width, movie.height);
-    TestSound sound(44100, 2, 16);
-    int64_t written = 0;
-    for (int number = 0; number <= movie.pictures; ++number) {
-        const int64_t until = number < movie.pictures ? number * 400'000 : INT64_MAX;
-        while (written < 88200 && written * 10'000'000 / 44100 <= until) {
-            const int count = static_cast<int>(std::min<int64_t>(512, 88200 - written));
-            MWWriteAudioData(file, &sound.Next(count, written * 10'000'000 / 44100));
-            written += count;
-        }
-        if (number % 7 == 0)
-            std::this_thread::sleep_for(std::chrono::milliseconds(number % 3 * 4));
-        if (number < movie.pictures)
-            MWWriteVideoFrame(file, &picture.Paint(number, until));
-    }
+    EXPECT_TRUE(movie.Write(folder / "swift"));
+    void* file = movie.Create(folder / "slow");
+    movie.WriteAll(file, [](int picture) {
+        if (picture % 7 == 0)
+            std::this_thread::sleep_for(std::chrono::milliseconds(picture % 3 * 4));
+    });
     EXPECT_EQ(MWCloseMediaFile(file, nullptr, nullptr), 1);
     MWSetWriterOptions(nullptr);
-    EXPECT_GT(content("swift").size(), 10'000U);
-    EXPECT_TRUE(content("swift") == content("slow"));
+    const std::string swift = ReadFile(folder / "swift");
+    EXPECT_GT(swift.size(), 10'000U);
+    EXPECT_TRUE(swift == ReadFile(folder / "slow"));
 }
 
 TEST(FitPicture, BordersKeepTheShapeAndStretchingFills) {
-    const PictureFit same = FitPicture(1280, 720, {1, 1}, 640, 360, false);
-    EXPECT_EQ(same.fittedWidth, 640);
-    EXPECT_EQ(same.fittedHeight, 360);
-    const PictureFit rounded = FitPicture(1280, 720, {1, 1}, 854, 480, true);
-    EXPECT_EQ(av_cmp_q(rounded.sampleAspect, {1, 1}), 0);
-    const PictureFit wide = FitPicture(720, 576, {64, 45}, 1280, 960, false);
-    EXPECT_EQ(wide.fittedWidth, 1280);
-    EXPECT_EQ(wide.fittedHeight, 720);
-    EXPECT_EQ(wide.top, 120);
-    EXPECT_EQ(av_cmp_q(wide.sampleAspect, {1, 1}), 0);
-    const PictureFit tall = FitPicture(480, 640, {1, 1}, 1280, 720, false);
-    EXPECT_EQ(tall.fittedHeight, 720);
-    EXPECT_EQ(tall.fittedWidth, 540);
-    EXPECT_EQ(tall.left, 370);
-    const PictureFit stretched = FitPicture(720, 576, {64, 45}, 1280, 960, true);
-    EXPECT_NEAR(av_q2d(stretched.sampleAspect) * 1280 / 960, 16.0 / 9, 0.01);
+    struct {
+        int width, height;
+        AVRational shape;
+        int outWidth, outHeight;
+        bool stretch;
+        int fittedWidth, fittedHeight, left, top;
+        AVRational outShape;
+    } const cases[] = {
+        {1280, 720, {1, 1}, 640, 360, false, 640, 360, 0, 0, {1, 1}},
+        {1280, 720, {1, 1}, 854, 480, true, 854, 480, 0, 0, {1, 1}}, // square but for the rounding
+        {720, 576, {64, 45}, 1280, 960, false, 1280, 720, 0, 120, {1, 1}},
+        {480, 640, {1, 1}, 1280, 720, false, 540, 720, 370, 0, {1, 1}},
+        {720, 576, {64, 45}, 1280, 960, true, 1280, 960, 0, 0, {4, 3}},
+    };
+    for (const auto& test : cases) {
+        SCOPED_TRACE(&test - cases);
+        const writer::PictureFit fit = writer::FitPicture(test.width, test.height, test.shape, test.outWidth,
+                                                          test.outHeight, test.stretch);
+        EXPECT_EQ(fit.fittedWidth, test.fittedWidth);
+        EXPECT_EQ(fit.fittedHeight, test.fittedHeight);
+        EXPECT_EQ(fit.left, test.left);
+        EXPECT_EQ(fit.top, test.top);
+        EXPECT_EQ(av_cmp_q(fit.sampleAspect, test.outShape), 0);
+    }
 }
 
 TEST(ExactRate, IsTheFractionThatIsMeant) {

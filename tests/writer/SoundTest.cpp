@@ -1,7 +1,6 @@
 // Sound on its way into the file: formats, rates, channels, lengths, places.
 #include "MovieReader.h"
-#include "TestSource.h"
-#include "writer/WriterStatus.h"
+#include "tests/support/Folder.h"
 
 #include <gtest/gtest.h>
 
@@ -10,12 +9,6 @@
 #include <vector>
 
 namespace {
-
-WriterStatus Latest() {
-    WriterStatus status{};
-    EXPECT_EQ(MWGetFileStatus(MWGetFileCount(), &status), 1);
-    return status;
-}
 
 /// Frequency by the rising zero crossings, without the first and the last tenth.
 double Frequency(const ReadMovie& movie) {
@@ -46,15 +39,13 @@ struct Pcm {
 class SoundFormats : public testing::TestWithParam<Pcm> {};
 
 TEST_P(SoundFormats, AreHeardAsTheyWere) {
-    const TemporaryFolder folder;
     TestMovie movie;
     movie.hasVideo = false;
     movie.sampleRate = GetParam().rate;
     movie.channels = GetParam().channels;
     movie.bits = GetParam().bits;
     movie.param.fccFileFormat = FourCC("M4A ");
-    ASSERT_TRUE(movie.Write(folder.Path("movie")));
-    const ReadMovie read = ReadMovieFile(folder.Path("movie"));
+    const ReadMovie read = WriteAndRead(movie);
     EXPECT_TRUE(read.readable);
     EXPECT_GE(read.sampleRate, std::min(GetParam().rate, 96000));
     EXPECT_LE(read.channels, GetParam().channels);
@@ -75,18 +66,21 @@ INSTANTIATE_TEST_SUITE_P(All, SoundFormats,
                                     std::to_string(info.param.bits);
                          });
 
+/// Uncompressed sound alone.
+TestMovie PcmMovie() {
+    TestMovie movie;
+    movie.hasVideo = false;
+    movie.param.fccFileFormat = FourCC("WAV ");
+    movie.param.fccAudio = FourCC("PCM ");
+    return movie;
+}
+
 TEST(Sound, PcmIsKeptToTheSample) {
     for (const int bits : {8, 16, 24, 32}) {
-        const TemporaryFolder folder;
-        TestMovie movie;
-        movie.hasVideo = false;
-        movie.bits = bits;
+        TestMovie movie = PcmMovie();
+        movie.bits = movie.param.nBitsPerSample = bits;
         movie.soundSeconds = 1.2345;
-        movie.param.nBitsPerSample = bits;
-        movie.param.fccFileFormat = FourCC("WAV ");
-        movie.param.fccAudio = FourCC("PCM ");
-        ASSERT_TRUE(movie.Write(folder.Path("movie")));
-        const ReadMovie read = ReadMovieFile(folder.Path("movie"));
+        const ReadMovie read = WriteAndRead(movie);
         ASSERT_EQ(read.samples, 54441);
         for (size_t i = 0; i < read.firstChannel.size(); ++i)
             ASSERT_NEAR(read.firstChannel[i], 0.5 * std::sin(2 * M_PI * 440.0 * i / 44100),
@@ -96,80 +90,63 @@ TEST(Sound, PcmIsKeptToTheSample) {
 }
 
 TEST(Sound, AFormatThatChangesOnTheWayLosesNothing) {
-    const TemporaryFolder folder;
-    TestMovie movie;
-    movie.hasVideo = false;
-    movie.param.fccFileFormat = FourCC("WAV ");
-    movie.param.fccAudio = FourCC("PCM ");
-    void* file = movie.Create(folder.Path("movie"));
-    TestSound first(44100, 2, 16);
-    TestSound second(22050, 1, 8);
-    for (int i = 0; i < 10; ++i) {
-        EXPECT_EQ(MWWriteAudioData(file, &first.Next(4410, 0)), 1);
-        EXPECT_EQ(MWWriteAudioData(file, &second.Next(2205, 0)), 1);
-    }
-    EXPECT_EQ(MWCloseMediaFile(file, nullptr, nullptr), 1);
-    EXPECT_NEAR(static_cast<double>(ReadMovieFile(folder.Path("movie")).samples), 88200, 20);
+    const ReadMovie read = WriteAndRead(PcmMovie(), [](void* file) {
+        TestSound first(44100, 2, 16);
+        TestSound second(22050, 1, 8);
+        for (int i = 0; i < 10; ++i) {
+            EXPECT_EQ(MWWriteAudioData(file, &first.Next(4410, 0)), 1);
+            EXPECT_EQ(MWWriteAudioData(file, &second.Next(2205, 0)), 1);
+        }
+    });
+    EXPECT_NEAR(static_cast<double>(read.samples), 88200, 20);
 }
 
 TEST(Sound, BlocksThatSplitASampleAreJoined) {
-    const TemporaryFolder folder;
-    TestMovie movie;
-    movie.hasVideo = false;
-    movie.param.fccFileFormat = FourCC("WAV ");
-    movie.param.fccAudio = FourCC("PCM ");
-    void* file = movie.Create(folder.Path("movie"));
-    TestSound sound(44100, 2, 16);
-    AudioFrame block = sound.Next(10'000, 0);
-    for (int position = 0; position < 40'000;) {
-        AudioFrame piece = block;
-        piece.pData += position;
-        piece.nLength = std::min(1001, 40'000 - position);
-        MWWriteAudioData(file, &piece);
-        position += piece.nLength;
-    }
-    EXPECT_EQ(MWCloseMediaFile(file, nullptr, nullptr), 1);
-    const ReadMovie read = ReadMovieFile(folder.Path("movie"));
+    const ReadMovie read = WriteAndRead(PcmMovie(), [](void* file) {
+        TestSound sound(44100, 2, 16);
+        AudioFrame piece = sound.Next(10'000, 0);
+        for (int position = 0; position < 40'000; position += piece.nLength, piece.pData += piece.nLength) {
+            piece.nLength = std::min(1001, 40'000 - position);
+            MWWriteAudioData(file, &piece);
+        }
+    });
     ASSERT_EQ(read.samples, 10'000);
     EXPECT_NEAR(Frequency(read), 440.0, 6.0);
 }
 
 TEST(Sound, LateSoundBeginsLate) {
-    for (const char* format : {"MP4 ", "MKV ", "AVI "}) {
-        const TemporaryFolder folder;
+    for (const uint32_t format : {FourCC("MP4 "), FourCC("MKV "), FourCC("AVI ")}) {
         TestMovie movie;
-        movie.param.fccFileFormat = FourCC(format[0], format[1], format[2], format[3]);
+        movie.param.fccFileFormat = format;
         movie.param.fccAudio = FourCC("MP3 ");
-        void* file = movie.Create(folder.Path("movie"));
-        TestPicture picture(160, 120);
-        TestSound sound(44100, 2, 16);
-        // As the engine sends it: the first block, 400 ms after the first picture, comes before all pictures.
-        MWWriteAudioData(file, &sound.Next(44100, 4'000'000));
-        for (int number = 0; number < 40; ++number)
-            MWWriteVideoFrame(file, &picture.Paint(number, number * 400'000));
-        EXPECT_EQ(MWCloseMediaFile(file, nullptr, nullptr), 1);
-        const ReadMovie read = ReadMovieFile(folder.Path("movie"));
-        size_t loud = 0;
-        while (loud < read.firstChannel.size() && std::abs(read.firstChannel[loud]) < 0.2)
-            ++loud;
-        EXPECT_NEAR(read.audioStart + static_cast<double>(loud) / read.sampleRate, 0.4, 0.03) << format;
-        EXPECT_NEAR(read.pictures.front().time, 0.0, 0.03) << format;
+        const ReadMovie read = WriteAndRead(movie, [](void* file) {
+            TestPicture picture(160, 120);
+            TestSound sound(44100, 2, 16);
+            // As the engine sends it: the first block, 400 ms after the first picture, comes before all.
+            MWWriteAudioData(file, &sound.Next(44100, 4'000'000));
+            for (int number = 0; number < 40; ++number)
+                MWWriteVideoFrame(file, &picture.Paint(number, number * 400'000));
+        });
+        EXPECT_NEAR(read.ToneBegins(), 0.4, 0.03) << read.format;
+        EXPECT_NEAR(read.pictures.front().time, 0.0, 0.03) << read.format;
     }
 }
 
 TEST(Sound, BitRatesAreKeptWithinTheCodecsLimits) {
-    const TemporaryFolder folder;
+    const Folder folder;
     TestMovie movie;
     movie.hasVideo = false;
     movie.sampleRate = 8000;
     movie.channels = 1;
-    for (const auto& [format, codec] : {std::pair{"M4A ", "AAC "}, std::pair{"MP3 ", "MP3 "},
-                                        std::pair{"OGG ", "VORB"}, std::pair{"OGG ", "OPUS"}}) {
+    for (const auto& [format, codec] : {std::pair{FourCC("M4A "), FourCC("AAC ")},
+                                        {FourCC("MP3 "), FourCC("MP3 ")},
+                                        {FourCC("OGG "), FourCC("VORB")},
+                                        {FourCC("OGG "), FourCC("OPUS")}}) {
         for (const int rate : {1, 128'000, 10'000'000}) {
-            movie.param.fccFileFormat = FourCC(format[0], format[1], format[2], format[3]);
-            movie.param.fccAudio = FourCC(codec[0], codec[1], codec[2], codec[3]);
+            movie.param.fccFileFormat = format;
+            movie.param.fccAudio = codec;
             movie.param.nAudioBitrate = rate;
-            EXPECT_TRUE(movie.Write(folder.Path("movie"))) << codec << ' ' << rate << ' ' << Latest().szWhat;
+            EXPECT_TRUE(movie.Write(folder / "movie")) << codec << ' ' << rate << ' ' << Latest().szWhat;
             EXPECT_LE(Latest().nAudioBitrate, 400'000);
         }
     }

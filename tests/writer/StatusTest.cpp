@@ -1,26 +1,16 @@
 // The five functions with arguments that make no sense, and what the status header says of a file.
 #include "MovieReader.h"
-#include "TestSource.h"
-#include "text/Utf8.h"
-#include "writer/WriterStatus.h"
+#include "tests/support/Folder.h"
 
 #include <gtest/gtest.h>
 
 #include <cerrno>
 #include <filesystem>
-#include <fstream>
 #include <functional>
-#include <iterator>
 #include <string>
 #include <vector>
 
 namespace {
-
-WriterStatus Latest() {
-    WriterStatus status{};
-    EXPECT_EQ(MWGetFileStatus(MWGetFileCount(), &status), 1);
-    return status;
-}
 
 TEST(MediaWriter, TakesNullHandlesAndRecords) {
     const VideoImage image{};
@@ -28,8 +18,8 @@ TEST(MediaWriter, TakesNullHandlesAndRecords) {
     EXPECT_EQ(MWWriteVideoFrame(nullptr, &image), 0);
     EXPECT_EQ(MWWriteAudioData(nullptr, &frame), 0);
     EXPECT_EQ(MWCloseMediaFile(nullptr, nullptr, nullptr), 0);
-    const TemporaryFolder folder;
-    void* file = TestMovie().Create(folder.Path("movie"));
+    const Folder folder;
+    void* file = TestMovie().Create(folder / "movie");
     ASSERT_NE(file, nullptr);
     EXPECT_EQ(MWWriteVideoFrame(file, nullptr), 0);
     EXPECT_EQ(MWWriteAudioData(file, nullptr), 0);
@@ -37,8 +27,8 @@ TEST(MediaWriter, TakesNullHandlesAndRecords) {
 }
 
 TEST(MediaWriter, RefusesRecordsThatMakeNoSense) {
-    const TemporaryFolder folder;
-    void* file = TestMovie().Create(folder.Path("movie"));
+    const Folder folder;
+    void* file = TestMovie().Create(folder / "movie");
     ASSERT_NE(file, nullptr);
     TestPicture picture(160, 120);
     const VideoImage good_image = picture.Paint(0, 0);
@@ -81,15 +71,15 @@ struct Refusal {
 class Refusals : public testing::TestWithParam<Refusal> {};
 
 TEST_P(Refusals, GiveNullAndTheReason) {
-    const TemporaryFolder folder;
+    const Folder folder;
     TestMovie movie;
     GetParam().spoil(movie);
-    EXPECT_EQ(movie.Create(folder.Path("movie")), nullptr);
+    EXPECT_EQ(movie.Create(folder / "movie"), nullptr);
     WriterStatus status{};
     ASSERT_EQ(MWGetLastFailure(&status), 1);
     EXPECT_EQ(status.nError, GetParam().error);
     EXPECT_EQ(status.nState, kWriterFileFailed);
-    EXPECT_EQ(status.szPath, folder.Path("movie"));
+    EXPECT_EQ(status.szPath, folder / "movie");
     EXPECT_NE(std::string(status.szWhat), "");
     EXPECT_TRUE(folder.Names().empty());
 }
@@ -117,21 +107,21 @@ INSTANTIATE_TEST_SUITE_P(MediaWriter, Refusals, testing::ValuesIn(kRefusals),
                          [](const auto& info) { return std::string(info.param.name); });
 
 TEST(MediaWriter, RefusesTargetsThatAreNotFiles) {
-    const TemporaryFolder folder;
+    const Folder folder;
     EXPECT_EQ(MWCreateMediaFile(nullptr, nullptr, nullptr, nullptr), nullptr);
     EXPECT_EQ(Latest().nError, kWriterErrorArgument);
     EXPECT_EQ(TestMovie().Create(folder.Path()), nullptr);
     EXPECT_EQ(Latest().nSystemError, EISDIR);
     EXPECT_EQ(TestMovie().Create("/dev/null"), nullptr);
     EXPECT_EQ(Latest().nError, kWriterErrorOpen);
-    EXPECT_EQ(TestMovie().Create(folder.Path("missing/movie")), nullptr);
+    EXPECT_EQ(TestMovie().Create(folder / "missing/movie"), nullptr);
     EXPECT_EQ(Latest().nSystemError, ENOENT);
 }
 
 TEST(MediaWriter, KeepsAnExistingFileWhenAsked) {
-    const TemporaryFolder folder;
-    const std::string path = folder.Path("movie");
-    std::ofstream(path) << "precious";
+    const Folder folder;
+    const std::string path = folder / "movie";
+    WriteFile(path, "precious");
     WriterOptions options{};
     options.bKeepExisting = 1;
     MWSetWriterOptions(&options);
@@ -141,7 +131,7 @@ TEST(MediaWriter, KeepsAnExistingFileWhenAsked) {
     std::filesystem::remove(path);
     void* file = TestMovie().Create(path);
     TestMovie().WriteAll(file);
-    std::ofstream(path) << "precious";
+    WriteFile(path, "precious");
     EXPECT_EQ(MWCloseMediaFile(file, nullptr, nullptr), 0);
     EXPECT_EQ(Latest().nSystemError, EEXIST);
     EXPECT_EQ(std::filesystem::file_size(path), 8U);
@@ -152,34 +142,34 @@ TEST(MediaWriter, KeepsAnExistingFileWhenAsked) {
 }
 
 TEST(MediaWriter, WritesThroughALinkAndLeavesIt) {
-    const TemporaryFolder folder;
-    std::ofstream(folder.Path("real")) << "old";
-    std::filesystem::create_symlink("real", folder.Path("link"));
-    EXPECT_TRUE(TestMovie().Write(folder.Path("link")));
-    EXPECT_TRUE(std::filesystem::is_symlink(folder.Path("link")));
-    EXPECT_EQ(ReadMovieFile(folder.Path("real")).pictures.size(), 50U);
+    const Folder folder;
+    WriteFile(folder / "real", "old");
+    std::filesystem::create_symlink("real", folder / "link");
+    EXPECT_TRUE(TestMovie().Write(folder / "link"));
+    EXPECT_TRUE(std::filesystem::is_symlink(folder / "link"));
+    EXPECT_EQ(ReadMovieFile(folder / "real").pictures.size(), 50U);
 }
 
 TEST(MediaWriter, TakesAnyName) {
-    const TemporaryFolder folder;
+    const Folder folder;
     std::string longest(255, 'x');
     for (const std::string& name :
          {std::string("file:http:movie"), std::string("100% \"quoted\" 'name'"), std::string("-dash..mp4"),
           std::string("\xD0\xA4\xD0\xB8\xD0\xBB\xD1\x8C\xD0\xBC"), std::string("latin-\xE9.mp4"), longest,
           longest.replace(3, 2, "\xC3\xA9")}) {
-        EXPECT_TRUE(TestMovie().Write(folder.Path(name))) << name;
+        EXPECT_TRUE(TestMovie().Write(folder / name)) << name;
         EXPECT_EQ(folder.Names(), std::vector<std::string>{name});
-        EXPECT_EQ(Latest().szPath, folder.Path(name));
-        std::filesystem::remove(folder.Path(name));
+        EXPECT_EQ(Latest().szPath, folder / name);
+        std::filesystem::remove(folder / name);
     }
 }
 
 TEST(MediaWriter, DoesNotTouchTheRemainsOfAnEarlierRun) {
-    const TemporaryFolder folder;
-    std::ofstream(folder.Path("movie.part")) << "remains";
-    EXPECT_TRUE(TestMovie().Write(folder.Path("movie")));
+    const Folder folder;
+    WriteFile(folder / "movie.part", "remains");
+    EXPECT_TRUE(TestMovie().Write(folder / "movie"));
     EXPECT_EQ(folder.Names(), (std::vector<std::string>{"movie", "movie.part"}));
-    EXPECT_EQ(std::filesystem::file_size(folder.Path("movie.part")), 7U);
+    EXPECT_EQ(std::filesystem::file_size(folder / "movie.part"), 7U);
 }
 
 TEST(MediaWriter, TellsAListenerOfAFilesLife) {
@@ -199,15 +189,14 @@ TEST(MediaWriter, TellsAListenerOfAFilesLife) {
         self->last = *status;
     };
     MWSetWriterOptions(&options);
-    const TemporaryFolder folder;
-    EXPECT_TRUE(TestMovie().Write(folder.Path("movie")));
+    const Folder folder;
+    EXPECT_TRUE(TestMovie().Write(folder / "movie"));
     EXPECT_EQ(heard.events,
               (std::vector<int>{kWriterEventOpened, kWriterEventFinishing, kWriterEventClosed}));
     EXPECT_TRUE(std::is_sorted(heard.finished.begin(), heard.finished.end()));
     EXPECT_GT(heard.finished.size(), 3U);
     EXPECT_EQ(heard.last.nState, kWriterFileComplete);
-    EXPECT_EQ(heard.last.llBytesWritten,
-              static_cast<int64_t>(std::filesystem::file_size(folder.Path("movie"))));
+    EXPECT_EQ(heard.last.llBytesWritten, static_cast<int64_t>(std::filesystem::file_size(folder / "movie")));
     EXPECT_EQ(std::string(heard.last.szTemporaryPath), "");
     EXPECT_EQ(heard.last.llPicturesReceived, 50);
     EXPECT_DOUBLE_EQ(heard.last.dVideoReceived, 2.0);
@@ -220,8 +209,8 @@ TEST(MediaWriter, RemembersTheLatestFilesOnly) {
     WriterStatus status{};
     EXPECT_EQ(MWGetFileStatus(0, &status), 0);
     EXPECT_EQ(MWGetFileStatus(MWGetFileCount() + 1, &status), 0);
-    const TemporaryFolder folder;
-    void* open = TestMovie().Create(folder.Path("open"));
+    const Folder folder;
+    void* open = TestMovie().Create(folder / "open");
     const int number = MWGetFileCount();
     for (int i = 0; i < 80; ++i)
         MWCreateMediaFile(L"", nullptr, nullptr, nullptr);

@@ -5,10 +5,6 @@
 #include <algorithm>
 #include <cmath>
 #include <cstring>
-#include <filesystem>
-#include <stdexcept>
-
-#include <stdlib.h>
 
 namespace {
 
@@ -16,26 +12,6 @@ constexpr int64_t kSecond = 10'000'000;
 constexpr double kFrequency = 440.0;
 
 } // namespace
-
-TemporaryFolder::TemporaryFolder() {
-    std::string name = (std::filesystem::temp_directory_path() / "writer-test-XXXXXX").string();
-    if (mkdtemp(name.data()) == nullptr)
-        throw std::runtime_error("no temporary folder");
-    path_ = name;
-}
-
-TemporaryFolder::~TemporaryFolder() {
-    std::error_code ignored;
-    std::filesystem::remove_all(path_, ignored);
-}
-
-std::vector<std::string> TemporaryFolder::Names() const {
-    std::vector<std::string> names;
-    for (const auto& entry : std::filesystem::directory_iterator(path_))
-        names.push_back(entry.path().filename().string());
-    std::sort(names.begin(), names.end());
-    return names;
-}
 
 TestPicture::TestPicture(int width, int height, int pitchExtra) {
     const int chroma_width = (width + 1) / 2;
@@ -120,7 +96,7 @@ void* TestMovie::Create(const std::string& path) const {
                              hasAudio ? &audio : nullptr);
 }
 
-void TestMovie::WriteAll(void* file) const {
+void TestMovie::WriteAll(void* file, const std::function<void(int)>& before) const {
     TestPicture picture(width, height, pitchExtra);
     TestSound sound(sampleRate, channels, bits, quietSeconds);
     const int64_t samples = std::llround(soundSeconds * sampleRate);
@@ -135,6 +111,8 @@ void TestMovie::WriteAll(void* file) const {
     for (int number = 0; hasVideo && number < pictures; ++number) {
         const auto time = static_cast<int64_t>(std::llround(number * kSecond / rate));
         write_sound(time);
+        if (before)
+            before(number);
         MWWriteVideoFrame(file, &picture.Paint(number, time));
     }
     write_sound(INT64_MAX);

@@ -8,25 +8,9 @@
 #include "media/MediaWriter.h"
 
 #include <cstdint>
+#include <functional>
 #include <string>
 #include <vector>
-
-/// A folder that goes away with all that is in it.
-class TemporaryFolder {
-public:
-    TemporaryFolder();
-    TemporaryFolder(const TemporaryFolder&) = delete;
-    TemporaryFolder& operator=(const TemporaryFolder&) = delete;
-    ~TemporaryFolder();
-
-    std::string Path(const std::string& name) const { return path_ + "/" + name; }
-    const std::string& Path() const { return path_; }
-    /// Names of what is in it, sorted.
-    std::vector<std::string> Names() const;
-
-private:
-    std::string path_;
-};
 
 /// One picture: a moving ramp with a bright block whose place tells the picture's number.
 class TestPicture {
@@ -83,8 +67,9 @@ struct TestMovie {
     /// Creates the file; null when the writer refuses.
     void* Create(const std::string& path) const;
 
-    /// Writes everything in the order of the engine: sound up to a picture's time, then the picture.
-    void WriteAll(void* file) const;
+    /// Writes everything in the order of the engine: sound up to a picture's time, then the picture. `before`
+    /// is called with the number of every picture before it is written.
+    void WriteAll(void* file, const std::function<void(int)>& before = nullptr) const;
 
     /// Creates, writes and closes; true when the writer says that the file is complete.
     bool Write(const std::string& path) const;
