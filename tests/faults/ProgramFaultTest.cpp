@@ -12,7 +12,6 @@
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
-#include <iterator>
 #include <set>
 #include <sys/stat.h>
 #include <thread>
@@ -104,14 +103,12 @@ TEST(LogFault, AStallIsNamed) {
     ASSERT_EQ(mkfifo((folder / "in").c_str(), 0600), 0);
     Running running({folder / "in", folder / "out.mp4", "--log", folder / "log", "--progress", "json"},
                     false);
-    std::ifstream from(source, std::ios::binary);
-    const std::string bytes{std::istreambuf_iterator<char>(from), {}};
+    const std::string bytes = ReadFile(source);
     std::ofstream to(folder / "in", std::ios::binary);
     const auto half = static_cast<std::streamsize>(bytes.size() / 2);
     to.write(bytes.data(), half).flush();
     const auto logged = [&](const char* line) {
-        std::ifstream log(folder / "log");
-        return std::string(std::istreambuf_iterator<char>(log), {}).find(line) != std::string::npos;
+        return ReadFile(folder / "log").find(line) != std::string::npos;
     };
     while (!logged("A decoder waits for the source for 5.") ||
            !logged("The conversion waits for the picture decoder for 5."))

@@ -43,8 +43,6 @@ void TakeSound(AudioDecoder& decoder, Seen& seen) {
     }
 }
 
-/// Everything from `begin` on, pictures first: the decoders must not depend on an even interleaving of the
-/// calls.
 } // namespace
 
 Seen TakeAll(host::Movie& movie, double begin) {

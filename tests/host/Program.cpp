@@ -4,8 +4,6 @@
 #include <cstdio>
 #include <cstdlib>
 #include <fcntl.h>
-#include <fstream>
-#include <iterator>
 #include <pty.h>
 #include <sys/wait.h>
 #include <termios.h>
@@ -14,14 +12,19 @@
 namespace program {
 namespace {
 
-[[noreturn]] void Become(const std::vector<std::string>& arguments) {
-    std::vector<char*> argv{const_cast<char*>(MOVIECONV_PROGRAM)};
-    for (const std::string& argument : arguments) {
+[[noreturn]] void Become(const std::vector<std::string>& command) {
+    std::vector<char*> argv;
+    for (const std::string& argument : command) {
         argv.push_back(const_cast<char*>(argument.c_str()));
     }
     argv.push_back(nullptr);
-    execv(MOVIECONV_PROGRAM, argv.data());
+    execvp(argv[0], argv.data());
     _exit(127);
+}
+
+std::vector<std::string> Movieconv(std::vector<std::string> arguments) {
+    arguments.insert(arguments.begin(), MOVIECONV_PROGRAM);
+    return arguments;
 }
 
 int Code(int status) {
@@ -40,7 +43,7 @@ std::string ReadAll(std::FILE* file) {
 
 } // namespace
 
-Result Call(const std::vector<std::string>& arguments) {
+Result Run(const std::vector<std::string>& command) {
     std::FILE* out = std::tmpfile();
     std::FILE* err = std::tmpfile();
     const pid_t child = fork();
@@ -48,11 +51,15 @@ Result Call(const std::vector<std::string>& arguments) {
         dup2(open("/dev/null", O_RDONLY), 0);
         dup2(fileno(out), 1);
         dup2(fileno(err), 2);
-        Become(arguments);
+        Become(command);
     }
     int status = 0;
     waitpid(child, &status, 0);
     return {Code(status), ReadAll(out), ReadAll(err)};
+}
+
+Result Call(const std::vector<std::string>& arguments) {
+    return Run(Movieconv(arguments));
 }
 
 Running::Running(const std::vector<std::string>& arguments, bool terminal) {
@@ -61,7 +68,7 @@ Running::Running(const std::vector<std::string>& arguments, bool terminal) {
         child_ = forkpty(&output_, nullptr, nullptr, &size);
         if (child_ == 0) {
             setenv("TERM", "xterm", 1);
-            Become(arguments);
+            Become(Movieconv(arguments));
         }
         return;
     }
@@ -73,7 +80,7 @@ Running::Running(const std::vector<std::string>& arguments, bool terminal) {
     if (child_ == 0) {
         dup2(open("/dev/null", O_RDONLY), 0);
         dup2(ends[1], 1);
-        Become(arguments);
+        Become(Movieconv(arguments));
     }
     close(ends[1]);
     output_ = ends[0];

@@ -14,6 +14,9 @@ struct Result {
     std::string err;
 };
 
+/// Runs a program, its name first, to its end.
+Result Run(const std::vector<std::string>& command);
+
 /// Runs movieconv to its end.
 Result Call(const std::vector<std::string>& arguments);
 

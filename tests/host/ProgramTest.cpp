@@ -11,8 +11,6 @@
 #include <cstdio>
 #include <fcntl.h>
 #include <filesystem>
-#include <fstream>
-#include <iterator>
 #include <sys/mount.h>
 #include <sys/stat.h>
 #include <thread>
@@ -38,35 +36,22 @@ std::string Flashing() {
                 Join(FlashPictures(8), Beeps(8), Args{"-c:v", "libx264", "-bf", "2", "-c:a", "aac"}));
 }
 
-std::string Content(const std::string& path) {
-    std::ifstream file(path, std::ios::binary);
-    return {std::istreambuf_iterator<char>(file), {}};
-}
-
-std::vector<std::string> FilesIn(const std::string& folder) {
-    std::vector<std::string> names;
-    for (const auto& entry : fs::directory_iterator(folder)) {
-        names.push_back(entry.path().filename().string());
-    }
-    std::sort(names.begin(), names.end());
-    return names;
-}
-
 Seen LookAt(const std::string& path) {
     host::Movie movie(path, {});
     return TakeAll(movie);
 }
 
-void ExpectInStep(const std::string& path, std::size_t flashes) {
+/// The flashes of a movie, each of which must come with its beep.
+std::size_t FlashesInStep(const std::string& path) {
     host::Movie movie(path, {});
     const Seen seen = TakeAll(movie);
     const std::vector<double> light = Flashes(seen);
     const std::vector<double> sound = Beginnings(seen, movie.Info().sound->sampleRate);
-    ASSERT_EQ(light.size(), flashes) << path;
-    ASSERT_EQ(sound.size(), flashes) << path;
-    for (std::size_t i = 0; i < flashes; ++i) {
+    EXPECT_EQ(light.size(), sound.size()) << path;
+    for (std::size_t i = 0; i < std::min(light.size(), sound.size()); ++i) {
         EXPECT_NEAR(light[i], sound[i], 0.025) << path << ", flash " << i;
     }
+    return light.size();
 }
 
 TEST(Program, WritesEveryPictureOnceAndAllSound) {
@@ -76,7 +61,7 @@ TEST(Program, WritesEveryPictureOnceAndAllSound) {
     EXPECT_EQ(result.err, "");
     EXPECT_NE(result.out.find("100% done"), std::string::npos) << result.out;
     EXPECT_EQ(result.out.find('\r'), std::string::npos);
-    EXPECT_EQ(FilesIn(folder.Path()), Args{"out.mp4"});
+    EXPECT_EQ(folder.Names(), Args{"out.mp4"});
 
     host::Movie movie(folder / "out.mp4", {});
     EXPECT_EQ(movie.Info().pictures->codec, "mpeg4");
@@ -95,31 +80,22 @@ TEST(Program, WritesEveryPictureOnceAndAllSound) {
 TEST(Program, KeepsSoundAndPicturesInStep) {
     const Folder folder;
     ASSERT_EQ(Call({Flashing(), folder / "out.mp4"}).code, 0);
-    ExpectInStep(folder / "out.mp4", 8);
+    EXPECT_EQ(FlashesInStep(folder / "out.mp4"), 8u);
     ASSERT_EQ(Call({Flashing(), folder / "part.mkv", "--begin", "2.5", "--length", "4"}).code, 0);
-    ExpectInStep(folder / "part.mkv", 4);
+    EXPECT_EQ(FlashesInStep(folder / "part.mkv"), 4u);
 }
 
 TEST(Program, SplitsIntoClipsInStep) {
     const Folder folder;
     const Result result = Call({Flashing(), folder / "clip.mp4", "--split", "2.4"});
     ASSERT_EQ(result.code, 0) << result.err;
-    const std::vector<std::string> names = FilesIn(folder.Path());
+    const std::vector<std::string> names = folder.Names();
     EXPECT_GE(names.size(), 4u);
     std::size_t pictures = 0;
     std::size_t flashes = 0;
     for (const std::string& name : names) {
-        SCOPED_TRACE(name);
-        host::Movie movie(folder / name, {});
-        const Seen seen = TakeAll(movie);
-        pictures += seen.pictures.size();
-        const std::vector<double> light = Flashes(seen);
-        const std::vector<double> sound = Beginnings(seen, 44100);
-        ASSERT_EQ(light.size(), sound.size());
-        for (std::size_t i = 0; i < light.size(); ++i) {
-            EXPECT_NEAR(light[i], sound[i], 0.025) << i;
-        }
-        flashes += light.size();
+        pictures += LookAt(folder / name).pictures.size();
+        flashes += FlashesInStep(folder / name);
     }
     EXPECT_EQ(pictures, 200u);
     EXPECT_EQ(flashes, 8u);
@@ -128,10 +104,10 @@ TEST(Program, SplitsIntoClipsInStep) {
 struct Odd {
     const char* name;
     Args making;
-    Args options;
     const char* output;
     std::size_t pictures;
     double sound; // seconds
+    Args options = {};
 };
 
 class ProgramTakes : public testing::TestWithParam<Odd> {};
@@ -150,47 +126,34 @@ TEST_P(ProgramTakes, AndConvertsAll) {
     EXPECT_NEAR(seconds, odd.sound, odd.sound > 0 ? 0.06 : 0);
 }
 
+Args Lossless(double pictureSeconds, double soundSeconds) {
+    return Join(CountedPictures(pictureSeconds), Beeps(soundSeconds), kLossless);
+}
+
+const Args kLateSound = Join(CountedPictures(3), Args{"-itsoffset", "1"}, Beeps(2), kLossless);
+const Args kSurround = Join(CountedPictures(1), Beeps(1), Args{"-c:v", "mpeg4", "-c:a", "ac3", "-ac", "6"});
+
 // A part has the pictures shown at its begin and at its end, and one more: the engine stops after a picture.
-INSTANTIATE_TEST_SUITE_P(
-    Sources, ProgramTakes,
-    testing::Values(
-        Odd{"size.mkv",
-            Join(CountedPictures(1), Args{"-vf", "scale=161:121", "-c:v", "ffv1"}),
-            {},
-            "o.mp4",
-            25,
-            0},
-        Odd{"mono8.wav", Join(Beeps(2), Args{"-c:a", "pcm_u8", "-ar", "8000"}), {}, "o.m4a", 0, 2},
-        Odd{"surround.mkv",
-            Join(CountedPictures(1), Beeps(1), Args{"-c:v", "mpeg4", "-c:a", "ac3", "-ac", "6"}),
-            {},
-            "o.mp4",
-            25,
-            1},
-        Odd{"silent.mp4", Join(CountedPictures(1), Args{"-c:v", "libx264"}), {}, "o.mp4", 25, 0},
-        Odd{"one.mp4", Join(CountedPictures(0.04), Args{"-c:v", "libx264"}), {}, "o.mp4", 1, 0},
-        Odd{"short-sound.mkv", Join(CountedPictures(3), Beeps(1), kLossless), {}, "o.mp4", 75, 3},
-        Odd{"long-sound.mkv", Join(CountedPictures(1), Beeps(3), kLossless), {}, "o.mp4", 25, 3},
-        Odd{"late-sound.mkv",
-            Join(CountedPictures(3), Args{"-itsoffset", "1"}, Beeps(2), kLossless),
-            {},
-            "o.avi",
-            75,
-            3},
-        Odd{"plain.mkv", Join(CountedPictures(2), Beeps(2), kLossless), {"--no-audio"}, "o.mkv", 50, 0},
-        Odd{"plain.mkv", Join(CountedPictures(2), Beeps(2), kLossless), {"--no-video"}, "o.mp3", 0, 2},
-        Odd{"plain.mkv",
-            Join(CountedPictures(2), Beeps(2), kLossless),
-            {"--begin", "0.5", "--length", "1"},
-            "o.webm",
-            27,
-            1},
-        Odd{"plain.mkv",
-            Join(CountedPictures(2), Beeps(2), kLossless),
-            {"--size", "80x80", "--frame-rate", "12.5", "--video-codec", "h264"},
-            "o.ts",
-            25,
-            2}));
+const Odd kOddities[] = {
+    {"size.mkv", Join(CountedPictures(1), Args{"-vf", "scale=161:121", "-c:v", "ffv1"}), "o.mp4", 25, 0},
+    {"mono8.wav", Join(Beeps(2), Args{"-c:a", "pcm_u8", "-ar", "8000"}), "o.m4a", 0, 2},
+    {"surround.mkv", kSurround, "o.mp4", 25, 1},
+    {"silent.mp4", Join(CountedPictures(1), Args{"-c:v", "libx264"}), "o.mp4", 25, 0},
+    {"one.mp4", Join(CountedPictures(0.04), Args{"-c:v", "libx264"}), "o.mp4", 1, 0},
+    {"short-sound.mkv", Lossless(3, 1), "o.mp4", 75, 3},
+    {"long-sound.mkv", Lossless(1, 3), "o.mp4", 25, 3},
+    {"late-sound.mkv", kLateSound, "o.avi", 75, 3},
+    {"plain.mkv", Lossless(2, 2), "o.mkv", 50, 0, {"--no-audio"}},
+    {"plain.mkv", Lossless(2, 2), "o.mp3", 0, 2, {"--no-video"}},
+    {"plain.mkv", Lossless(2, 2), "o.webm", 27, 1, {"--begin", "0.5", "--length", "1"}},
+    {"plain.mkv",
+     Lossless(2, 2),
+     "o.ts",
+     25,
+     2,
+     {"--size", "80x80", "--frame-rate", "12.5", "--video-codec", "h264"}},
+};
+INSTANTIATE_TEST_SUITE_P(Sources, ProgramTakes, testing::ValuesIn(kOddities));
 
 TEST(Program, TakesNamesInAnyScript) {
     const Folder folder;
@@ -212,9 +175,9 @@ TEST(Program, RefusesAndLeavesEverythingAsItWas) {
     const std::string source = folder / "in.mkv";
     fs::copy_file(Counted(), source);
     fs::create_hard_link(source, folder / "same.mkv");
-    std::ofstream(folder / "there.mp4") << "precious";
-    std::ofstream(folder / "clip_03.mp4") << "precious";
-    const std::vector<std::string> before = FilesIn(folder.Path());
+    WriteFile(folder / "there.mp4", "precious");
+    WriteFile(folder / "clip_03.mp4", "precious");
+    const std::vector<std::string> before = folder.Names();
     struct Refusal {
         Args arguments;
         int code;
@@ -248,10 +211,10 @@ TEST(Program, RefusesAndLeavesEverythingAsItWas) {
         const Result result = Call(refusal.arguments);
         EXPECT_EQ(result.code, refusal.code) << result.err;
         EXPECT_NE(result.err.find(refusal.word), std::string::npos) << result.err;
-        EXPECT_EQ(FilesIn(folder.Path()), before) << result.err;
+        EXPECT_EQ(folder.Names(), before) << result.err;
     }
-    EXPECT_EQ(Content(folder / "there.mp4"), "precious");
-    EXPECT_EQ(Content(source), Content(Counted()));
+    EXPECT_EQ(ReadFile(folder / "there.mp4"), "precious");
+    EXPECT_EQ(ReadFile(source), ReadFile(Counted()));
     EXPECT_EQ(Call({source, folder / "there.mp4", "-y"}).code, 0);
     EXPECT_GT(fs::file_size(folder / "there.mp4"), 1000u);
 }
@@ -262,7 +225,7 @@ TEST(Program, PrintsValidJsonAndNothingElse) {
                                 "--log", folder / "log"});
     ASSERT_EQ(result.code, 0) << result.err;
     EXPECT_EQ(result.err, "");
-    std::ofstream(folder / "events") << result.out;
+    WriteFile(folder / "events", result.out);
     const char* check =
         "import json, sys\n"
         "events = [json.loads(line) for line in open(sys.argv[1], encoding='utf-8', newline='\\n')]\n"
@@ -272,8 +235,8 @@ TEST(Program, PrintsValidJsonAndNothingElse) {
         "assert kinds.count('clip_opened') == kinds.count('clip_closed') >= 2\n"
         "assert events[-1]['exit_code'] == 0 and events[-1]['outcome'] == 'done'\n"
         "assert all(e['percent'] < 100 for e in events if e['event'] == 'progress')\n";
-    EXPECT_EQ(RunProgram({"python3", "-c", check, folder / "events"}), 0) << result.out;
-    EXPECT_NE(Content(folder / "log").find("Encoding thread Exit."), std::string::npos);
+    EXPECT_EQ(program::Run({"python3", "-c", check, folder / "events"}).code, 0) << result.out;
+    EXPECT_NE(ReadFile(folder / "log").find("Encoding thread Exit."), std::string::npos);
 }
 
 TEST(Program, KeepsAPreview) {
@@ -312,15 +275,23 @@ class ProgramSignal : public testing::TestWithParam<int> {};
 TEST_P(ProgramSignal, FinishesAPlayableFile) {
     const Folder folder;
     Running running(Join(Slowly(folder / "out.mp4"), Args{"--progress", "json"}), false);
-    ASSERT_TRUE(running.WaitFor("\"position_s\":1."));
+    for (int report = 0; report < 4; ++report) {
+        ASSERT_TRUE(running.WaitFor("\"event\":\"progress\""));
+    }
     running.Signal(GetParam());
     const Result result = running.Finish();
     EXPECT_EQ(result.code, 6) << result.out;
     EXPECT_NE(result.out.find("\"outcome\":\"stopped\""), std::string::npos);
-    EXPECT_EQ(FilesIn(folder.Path()), Args{"out.mp4"});
-    const Seen seen = LookAt(folder / "out.mp4");
-    EXPECT_GE(seen.pictures.size(), 20u);
-    EXPECT_LT(seen.pictures.size(), 6000u);
+    EXPECT_EQ(folder.Names(), Args{"out.mp4"});
+    // What the full queues held is in the file, too.
+    EXPECT_EQ(result.out.find("\"event\":\"warning\""), std::string::npos) << result.out;
+    const std::string told = "\"video_s\":";
+    const std::size_t at = result.out.rfind(told);
+    ASSERT_NE(at, std::string::npos) << result.out;
+    const double seconds = std::atof(&result.out[at + told.size()]);
+    EXPECT_GT(seconds, 0);
+    EXPECT_LT(seconds, 60);
+    EXPECT_NEAR(static_cast<double>(LookAt(folder / "out.mp4").pictures.size()), seconds * 100, 1);
 }
 
 INSTANTIATE_TEST_SUITE_P(Signals, ProgramSignal, testing::Values(SIGINT, SIGTERM));
@@ -386,7 +357,7 @@ TEST(Program, StopsWhileItsSourceStalls) {
     const std::string pipe = folder / "pipe";
     ASSERT_EQ(mkfifo(pipe.c_str(), 0600), 0);
     const int end = open(pipe.c_str(), O_RDWR | O_CLOEXEC); // waits for nobody, and lets nobody see an end
-    const std::string movie = Content(
+    const std::string movie = ReadFile(
         Make("streamed.ts", Join(CountedPictures(8), Beeps(8), Args{"-c:v", "mpeg2video", "-c:a", "mp2"})));
     ASSERT_GE(fcntl(end, F_SETPIPE_SZ, 1 << 20), static_cast<int>(movie.size()));
     const std::size_t half = movie.size() / 2;
@@ -410,7 +381,7 @@ TEST(Program, WritesTheSameFileWhateverThePauses) {
         std::this_thread::sleep_for(std::chrono::milliseconds(10 + 17 * i % 50));
     }
     EXPECT_EQ(running.Finish().code, 0);
-    EXPECT_EQ(Content(folder / "steady.mp4"), Content(folder / "paused.mp4"));
+    EXPECT_EQ(ReadFile(folder / "steady.mp4"), ReadFile(folder / "paused.mp4"));
 }
 
 /// A small disk; usable only where the test may mount one.
@@ -446,14 +417,14 @@ TEST(Program, SaysThatTheDiskIsFullAndKeepsWhatIsDone) {
     EXPECT_EQ(result.code, 5) << result.err;
     EXPECT_NE(result.err.find("out.mov"), std::string::npos);
     EXPECT_FALSE(fs::exists(folder / "disk/out.mov"));
-    const std::vector<std::string> left = FilesIn(folder / "disk");
+    const std::vector<std::string> left = folder.Names("disk");
     ASSERT_EQ(left.size(), 1u);
     EXPECT_NE(result.err.find(left[0]), std::string::npos) << result.err;
     EXPECT_GT(LookAt(folder / "disk/" + left[0]).pictures.size(), 25u);
 
     fs::remove(folder / "disk/" + left[0]);
     EXPECT_EQ(Call(Join(making, Args{"--no-keep-partial"})).code, 5);
-    EXPECT_TRUE(FilesIn(folder / "disk").empty());
+    EXPECT_TRUE(folder.Names("disk").empty());
 }
 
 TEST(Program, WaitsForRoomWhenAsked) {

@@ -2,13 +2,12 @@
 #ifndef MOVIECONV_TESTS_HOST_TESTMOVIES_H
 #define MOVIECONV_TESTS_HOST_TESTMOVIES_H
 
+#include "tests/support/Folder.h"
+
 #include <string>
 #include <vector>
 
 namespace test_movies {
-
-/// Runs a program with its output discarded and returns its exit code; 128 plus the signal that ended it.
-int RunProgram(const std::vector<std::string>& arguments);
 
 /// The path of the movie `name`, made with `ffmpeg ARGUMENTS PATH` unless it exists. Fails the test when it
 /// cannot be.
@@ -25,20 +24,6 @@ constexpr int kCountedLumas = 50;
 constexpr int LumaOf(int picture) {
     return 20 + picture % kCountedLumas * 4;
 }
-
-/// A folder of the test's own, removed with what is in it.
-class Folder {
-public:
-    Folder();
-    ~Folder();
-    Folder(const Folder&) = delete;
-    Folder& operator=(const Folder&) = delete;
-    std::string operator/(const std::string& name) const { return path_ + "/" + name; }
-    const std::string& Path() const { return path_; }
-
-private:
-    std::string path_;
-};
 
 template <class... Lists>
 std::vector<std::string> Join(Lists... lists) {
