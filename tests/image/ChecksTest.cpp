@@ -114,29 +114,15 @@ TEST(ChecksDeathTest, Packed) {
     ExpectFailedCheck([] { YUY2_2_Rgb24(kSome, 1, 6, 0, 0, 0, 0, nullptr, 4, 1, 0, 0); }, 1232, buffers);
 }
 
-/// Memory that a process which is about to die shares with this one.
-class SharedBytes {
-public:
-    explicit SharedBytes(size_t size)
-        : bytes(static_cast<unsigned char*>(
-              mmap(nullptr, size, PROT_READ | PROT_WRITE, MAP_SHARED | MAP_ANONYMOUS, -1, 0))),
-          size(size) {}
-    ~SharedBytes() { munmap(bytes, size); }
-    SharedBytes(const SharedBytes&) = delete;
-    SharedBytes& operator=(const SharedBytes&) = delete;
-
-    unsigned char* const bytes;
-
-private:
-    const size_t size;
-};
-
 TEST(ChecksDeathTest, PackedToPlanesStopsBeforeTheFirstSampleOutside) {
     // V begins in row yDst / 2 = 2, the bound is the first sample of row ySrc + cy = 2: the group 0 of the
     // first pair of rows is inside, the group 1 is not.
     constexpr int kWidth = 8;
-    SharedBytes planes(6 * kWidth * 3);
-    unsigned char* const y = planes.bytes;
+    // Shared with the process that is about to die.
+    void* const planes =
+        mmap(nullptr, 6 * kWidth * 3, PROT_READ | PROT_WRITE, MAP_SHARED | MAP_ANONYMOUS, -1, 0);
+    ASSERT_NE(planes, MAP_FAILED);
+    auto* const y = static_cast<unsigned char*>(planes);
     unsigned char* const u = y + 6 * kWidth;
     unsigned char* const v = u + 6 * kWidth;
     unsigned char packed[2 * kWidth * 2];
@@ -151,6 +137,7 @@ TEST(ChecksDeathTest, PackedToPlanesStopsBeforeTheFirstSampleOutside) {
         EXPECT_EQ(u[i], row == 2 && column == 0 ? 200 : 0) << "U " << row << ", " << column;
         EXPECT_EQ(v[i], row == 2 && column == 0 ? 200 : 0) << "V " << row << ", " << column;
     }
+    munmap(planes, 6 * kWidth * 3);
 }
 
 TEST(Checks, TopDownAlphaMakesNone) {
