@@ -15,7 +15,8 @@ __attribute__((format(printf, 1, 2))) void Note(const char* format, ...) {
     char line[256];
     va_list arguments;
     va_start(arguments, format);
-    vsnprintf(line, sizeof line, format, arguments);
+    // The analyser does not see va_start here.
+    vsnprintf(line, sizeof line, format, arguments); // NOLINT(clang-analyzer-valist.Uninitialized)
     va_end(arguments);
     recorder::Note(line);
 }

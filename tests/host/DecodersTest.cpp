@@ -113,8 +113,8 @@ TEST(Decoders, KeepTheStampsOfAVariableRate) {
     const std::string path =
         Make("variable.mkv",
              {"-f", "lavfi", "-i",
-              "color=gray:s=160x120:r=25:d=4,format=yuv420p,geq=lum='20+mod(N,50)*4':cb=128:cr=128,"
-              "select='lt(mod(n,6),3)'",
+              ("color=gray:s=160x120:r=25:d=4,format=yuv420p,geq=lum='20+mod(N,50)*4':cb=128:cr=128,"
+               "select='lt(mod(n,6),3)'"),
               "-fps_mode", "vfr", "-c:v", "libx264", "-bf", "2"});
     Movie movie(path, {});
     const Seen seen = TakeAll(movie);
@@ -197,8 +197,8 @@ TEST(Decoders, HoldTheFirstPictureWhenSoundBeginsFirst) {
 TEST(Decoders, TurnPicturesUpright) {
     // The left half is bright; turned counter-clockwise, as the container asks, it is the lower half.
     const std::string flat = Make("half.mp4", {"-f", "lavfi", "-i",
-                                               "color=black:s=160x120:r=25:d=0.2,format=yuv420p,"
-                                               "drawbox=w=80:c=white:t=fill",
+                                               ("color=black:s=160x120:r=25:d=0.2,format=yuv420p,"
+                                                "drawbox=w=80:c=white:t=fill"),
                                                "-c:v", "libx264", "-qp", "10"});
     Movie movie(Make("turned.mp4", {"-i", flat, "-c", "copy", "-metadata:s:v", "rotate=90"}), {});
     const VideoFormat& format = movie.Pictures()->GetVideoInfo()->format;

@@ -26,7 +26,7 @@ protected:
     static void ExpectYuv(To420 kernel, int step, Expect expect) {
         constexpr size_t kWidth = 512;
         std::vector<uint8_t> row(kWidth * kPixelBytes);
-        std::vector<uint8_t> y0(kWidth), y1(kWidth), u(kWidth / 2), v(kWidth / 2);
+        std::vector<uint8_t> y(2 * kWidth), u(kWidth / 2), v(kWidth / 2);
         for (int r = 0; r < 256; r += step) {
             for (int g = 0; g < 256; g += step) {
                 for (size_t x = 0; x < kWidth; ++x) {
@@ -37,12 +37,11 @@ protected:
                     if constexpr (kPixelBytes == 4)
                         pixel[3] = static_cast<uint8_t>(37 * x);
                 }
-                kernel({{y0.data(), y1.data() - y0.data()}, {u.data(), 0}, {v.data(), 0}}, {row.data(), 0},
-                       {kWidth, 2});
+                kernel({{y.data(), kWidth}, {u.data(), 0}, {v.data(), 0}}, {row.data(), 0}, {kWidth, 2});
                 for (size_t b = 0; b < 256; ++b) {
                     const Yuv want = expect(Rgb{r, g, static_cast<int>(b)});
-                    ASSERT_TRUE(y0[2 * b] == want.y && y0[2 * b + 1] == want.y && y1[2 * b] == want.y &&
-                                y1[2 * b + 1] == want.y && u[b] == want.u && v[b] == want.v)
+                    ASSERT_TRUE(y[2 * b] == want.y && y[2 * b + 1] == want.y && y[kWidth + 2 * b] == want.y &&
+                                y[kWidth + 2 * b + 1] == want.y && u[b] == want.u && v[b] == want.v)
                         << "red " << r << ", green " << g << ", blue " << b;
                 }
             }
@@ -53,18 +52,18 @@ protected:
     template <int kPixelBytes, class Expect>
     static void ExpectRgb(From420 kernel, int step, Expect expect) {
         constexpr size_t kWidth = 256;
-        std::vector<uint8_t> y(kWidth), rgb0(kWidth * kPixelBytes), rgb1(kWidth * kPixelBytes);
+        constexpr size_t kRowBytes = kWidth * kPixelBytes;
+        std::vector<uint8_t> y(kWidth), rgb(2 * kRowBytes);
         for (size_t i = 0; i < kWidth; ++i)
             y[i] = static_cast<uint8_t>(i);
         for (int cb = 0; cb < 256; cb += step) {
             for (int cr = 0; cr < 256; cr += step) {
                 std::vector<uint8_t> u(kWidth / 2, Byte(cb)), v(kWidth / 2, Byte(cr));
-                kernel({rgb0.data(), rgb1.data() - rgb0.data()},
-                       {{y.data(), 0}, {u.data(), 0}, {v.data(), 0}}, {kWidth, 2});
+                kernel({rgb.data(), kRowBytes}, {{y.data(), 0}, {u.data(), 0}, {v.data(), 0}}, {kWidth, 2});
                 for (size_t i = 0; i < kWidth; ++i) {
                     const Rgb want = expect(Yuv{static_cast<int>(i), cb, cr});
-                    for (const auto* rgb : {&rgb0, &rgb1}) {
-                        const uint8_t* const pixel = rgb->data() + kPixelBytes * i;
+                    for (const size_t row : {0, 1}) {
+                        const uint8_t* const pixel = rgb.data() + row * kRowBytes + kPixelBytes * i;
                         ASSERT_TRUE(pixel[0] == want.b && pixel[1] == want.g && pixel[2] == want.r)
                             << "Y " << i << ", U " << cb << ", V " << cr;
                     }

@@ -47,7 +47,7 @@ private:
                          : static_cast<size_t>(rows - 1) * static_cast<size_t>(pitch) +
                                static_cast<size_t>(rowBytes);
     }
-    size_t Offset(int row, int byte) const { return static_cast<size_t>(row * pitch + byte); }
+    size_t Offset(int row, int byte) const { return static_cast<size_t>(ptrdiff_t{row} * pitch + byte); }
 
     GuardedMemory memory;
     std::span<uint8_t> bytes;
