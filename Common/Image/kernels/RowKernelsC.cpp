@@ -4,7 +4,6 @@
 #include "Common/Image/kernels/RowKernels.h"
 
 #include <algorithm>
-#include <cstring>
 
 namespace image {
 namespace {
@@ -206,7 +205,7 @@ void SwapPacked(Rows target, Rows source, Size size) {
 
 void Copy(Rows target, Rows source, Size size) {
     for (ptrdiff_t row = 0; row < size.height; ++row)
-        std::memcpy(target[row], source[row], static_cast<size_t>(size.width));
+        std::copy_n(source[row], size.width, target[row]);
 }
 
 void Halve(Rows target, Rows source, Size size) {
