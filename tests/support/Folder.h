@@ -15,8 +15,7 @@
 /// A folder that goes away with all that is in it.
 class Folder {
 public:
-    Folder() {
-        path_ = (std::filesystem::temp_directory_path() / "movieconv-XXXXXX").string();
+    Folder() : path_((std::filesystem::temp_directory_path() / "movieconv-XXXXXX").string()) {
         if (mkdtemp(path_.data()) == nullptr)
             throw std::runtime_error("no temporary folder");
     }
