@@ -51,8 +51,8 @@ ptrdiff_t EvenAbove(ptrdiff_t x) {
     return EvenBelow(x + 1);
 }
 
-/// The kernels for a packed picture. From about 8 MB on nothing of it stays in a cache until it is
-/// used: a picture of 1920x1080 with four bytes a pixel is large.
+/// The kernels for a packed picture: those for large ones from about 8 MB on, which 1920x1080 pixels of four
+/// bytes are, where writing past the caches pays.
 const RowKernels& KernelsFor(const Picture& target) {
     constexpr int64_t kLargeBytes = 8'000'000;
     const RowKernels& kernels = BestRowKernels();
