@@ -274,13 +274,13 @@ std::optional<Failure> Conversion::Verdict() {
         return files_.FirstFailure();
     }
     std::string reason = movie_.ReadError();
-    if (outcome_ == kOutcomeFailed) {
+    if (files_.Complete() == 0) { // the writer keeps no empty file
+        if (userStopped_ && reason.empty()) {
+            return std::nullopt;
+        }
         return Failure(ExitCode::kCannotRead,
                        reason.empty() ? fmt::format("\"{}\" holds nothing to convert", options_.input)
                                       : fmt::format("cannot read \"{}\": {}", options_.input, reason));
-    }
-    if (files_.Complete() == 0) {
-        return Failure(ExitCode::kInternal, fmt::format("no file was completed for \"{}\"", options_.output));
     }
     if (reason.empty() && EndedEarly() && HasShrunk(movie_.Info())) {
         reason = "the file was cut meanwhile";

@@ -240,22 +240,37 @@ bool MediaFile::Close() {
     record_->Update([](WriterStatus& status) { status.nState = kWriterFileFinishing; });
     record_->Tell(kWriterEventFinishing);
     DrainStages();
+    const int state = Conclude();
+    record_->Update([state](WriterStatus& status) {
+        status.nState = state;
+        status.dFinished = state == kWriterFileComplete ? 1.0 : status.dFinished;
+    });
+    record_->Tell(kWriterEventClosed);
+    return state == kWriterFileComplete;
+}
+
+/// What the file has become: complete, failed or empty.
+int MediaFile::Conclude() {
+    if (!record_->Failed() && Empty()) {
+        RemovePart();
+        record_->Update([](WriterStatus& status) { status.llBytesWritten = 0; });
+        return kWriterFileEmpty;
+    }
     if (!record_->Failed()) {
         try {
             FinishPart();
+            return kWriterFileComplete;
         } catch (...) {
             Fail(std::current_exception());
         }
     }
-    const bool complete = !record_->Failed();
-    if (!complete)
-        CloseFailed();
-    record_->Update([complete](WriterStatus& status) {
-        status.nState = complete ? kWriterFileComplete : kWriterFileFailed;
-        status.dFinished = complete ? 1.0 : status.dFinished;
-    });
-    record_->Tell(kWriterEventClosed);
-    return complete;
+    CloseFailed();
+    return kWriterFileFailed;
+}
+
+bool MediaFile::Empty() const {
+    const WriterStatus status = record_->Snapshot();
+    return status.llPicturesReceived == 0 && status.llSamplesReceived == 0;
 }
 
 void MediaFile::DrainStages() {
@@ -347,11 +362,15 @@ void MediaFile::Publish(const std::string& path, ByteFile& file) {
         WriteLog("Syncing the folder of \"%s\" failed: %s.", target_.c_str(), std::strerror(error));
 }
 
+void MediaFile::RemovePart() {
+    files_.Remove(partPath_);
+    record_->SetTemporaryPath("");
+}
+
 /// Leaves the temporary file in a form that players take, or removes it.
 void MediaFile::CloseFailed() {
     if (record_->Options().bRemovePartial != 0) {
-        files_.Remove(partPath_);
-        record_->SetTemporaryPath("");
+        RemovePart();
         return;
     }
     if (part_->Error() == 0 && !muxer_->Empty()) {

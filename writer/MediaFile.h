@@ -46,7 +46,8 @@ public:
     bool WriteVideo(const VideoImage& image);
     bool WriteAudio(const AudioFrame& frame);
 
-    /// Finishes the file; true when it is complete under its real name. Nothing may be called afterwards.
+    /// Finishes the file; true when it is complete under its real name. One that received nothing is no movie
+    /// and leaves nothing behind. Nothing may be called afterwards.
     bool Close();
 
 private:
@@ -61,10 +62,13 @@ private:
     WriterFailure Explain(const std::exception_ptr& error) const noexcept;
     void CancelStages();
     void DrainStages();
+    int Conclude();
+    bool Empty() const;
     void FinishPart();
     void JoinPart();
     void JoinInto(const std::string& path, const std::shared_ptr<ByteFile>& file);
     void Publish(const std::string& path, ByteFile& file);
+    void RemovePart();
     void CloseFailed();
     void Progress(double share);
 

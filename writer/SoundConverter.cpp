@@ -66,6 +66,11 @@ SoundConverter::SoundConverter(int rate, const AVChannelLayout& layout, AVSample
         throw std::bad_alloc();
 }
 
+size_t SoundConverter::PieceSize(const PcmFormat& format) const {
+    const int64_t frames = int64_t{kFramesAtOnce} * format.rate / rate_;
+    return static_cast<size_t>(std::max<int64_t>(1, frames) * format.BytesPerFrame());
+}
+
 void SoundConverter::Push(const PcmFormat& format, const uint8_t* data, size_t size) {
     if (!(format == source_))
         Prepare(format);

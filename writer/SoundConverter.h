@@ -29,6 +29,10 @@ public:
     /// What the encoder takes.
     SoundConverter(int rate, const AVChannelLayout& layout, AVSampleFormat format);
 
+    /// How many bytes of `format` are pushed at a time to keep little waiting here: about 16384 of the
+    /// encoder's sample frames, or one of the format's.
+    size_t PieceSize(const PcmFormat& format) const;
+
     /// Appends PCM. The format may change from call to call; bytes that do not fill a sample frame wait for
     /// the next call of the same format.
     void Push(const PcmFormat& format, const uint8_t* data, size_t size);

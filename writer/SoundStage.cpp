@@ -68,15 +68,23 @@ void SoundStage::Run(int64_t start) {
         EncodeAvailable(encoder_.FrameSize(), take);
         silence -= part;
     }
-    while (const std::optional<SoundBlock> block = queue_.Pop()) {
-        converter_.Push(block->format, block->data.data(), block->data.size());
-        EncodeAvailable(encoder_.FrameSize(), take);
-    }
+    while (const std::optional<SoundBlock> block = queue_.Pop())
+        Encode(*block, take);
     converter_.Finish();
     if (neverEmpty_ && empty_ && converter_.Available() == 0)
         converter_.PushSilence(1);
     EncodeAvailable(1, take);
     encoder_.Finish(take);
+}
+
+/// In pieces: a block of a low rate is far longer in the encoder's samples.
+void SoundStage::Encode(const SoundBlock& block, const PacketTaker& take) {
+    const size_t piece_size = converter_.PieceSize(block.format);
+    for (size_t done = 0; done < block.data.size() && !cancelled_; done += piece_size) {
+        converter_.Push(block.format, block.data.data() + done,
+                        std::min(piece_size, block.data.size() - done));
+        EncodeAvailable(encoder_.FrameSize(), take);
+    }
 }
 
 /// Encodes what has been converted in whole frames, as long as there are `least` sample frames.

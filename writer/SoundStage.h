@@ -57,6 +57,7 @@ public:
 
 private:
     void Run(int64_t start);
+    void Encode(const SoundBlock& block, const PacketTaker& take);
     void EncodeAvailable(int least, const PacketTaker& take);
 
     const bool fillsStart_;

@@ -21,7 +21,9 @@ enum {
     /// Closed by the engine; the rest is being encoded, the index written, the file synced.
     kWriterFileFinishing = 2,
     kWriterFileComplete = 3, ///< Complete, on the disk, under its real name.
-    kWriterFileFailed = 4    ///< Not complete and never will be; see nError. The real name was not touched.
+    kWriterFileFailed = 4,   ///< Not complete and never will be; see nError. The real name was not touched.
+    /// Closed without having received anything: removed, without an error. The real name was not touched.
+    kWriterFileEmpty = 5
 };
 
 /// What went wrong.
@@ -85,7 +87,7 @@ enum {
     kWriterEventFailed = 3,  ///< Writing failed; nothing more is taken. Comes once, long before the close.
     /// The close goes on; comes at its start and whenever dFinished has grown visibly.
     kWriterEventFinishing = 4,
-    kWriterEventClosed = 5 ///< The file is complete, or the failed one is closed.
+    kWriterEventClosed = 5 ///< The file is complete, or the failed or empty one is closed.
 };
 
 /// Told of what happens to files. Called on the engine's worker for all but kWriterEventFailed, which comes

@@ -177,6 +177,9 @@ TEST(Program, RefusesAndLeavesEverythingAsItWas) {
     fs::create_hard_link(source, folder / "same.mkv");
     WriteFile(folder / "there.mp4", "precious");
     WriteFile(folder / "clip_03.mp4", "precious");
+    const std::string whole = ReadFile(
+        Make("index-first.mp4", Join(CountedPictures(1), Beeps(1), Args{"-movflags", "+faststart"})));
+    WriteFile(folder / "head.mp4", whole.substr(0, whole.find("mdat") + 4)); // opens, but holds nothing
     const std::vector<std::string> before = folder.Names();
     struct Refusal {
         Args arguments;
@@ -198,6 +201,7 @@ TEST(Program, RefusesAndLeavesEverythingAsItWas) {
         {{source, folder / "out"}, 2, "--format"},
         {{folder / "none.mkv", folder / "out.mp4"}, 3, "none.mkv"},
         {{folder / "there.mp4", folder / "out.mp4"}, 3, "there.mp4"},
+        {{folder / "head.mp4", folder / "there.mp4", "-y"}, 3, "nothing to convert"},
         {{source, folder / "out.mp4", "--begin", "9"}, 2, "--begin"},
         {{source, folder / "out.mp4", "--begin", "soon"}, 2, "soon"},
         {{source, folder / "out.webm", "--video-codec", "XVID"}, 2, "XVID"},

@@ -97,8 +97,10 @@ TEST(Sound, AFormatThatChangesOnTheWayLosesNothing) {
             EXPECT_EQ(MWWriteAudioData(file, &first.Next(4410, 0)), 1);
             EXPECT_EQ(MWWriteAudioData(file, &second.Next(2205, 0)), 1);
         }
+        TestSound slow(100, 1, 8); // a block that is long in the file's samples
+        EXPECT_EQ(MWWriteAudioData(file, &slow.Next(500, 0)), 1);
     });
-    EXPECT_NEAR(static_cast<double>(read.samples), 88200, 20);
+    EXPECT_NEAR(static_cast<double>(read.samples), 88200 + 5 * 44100, 441);
 }
 
 TEST(Sound, BlocksThatSplitASampleAreJoined) {

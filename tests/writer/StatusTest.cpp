@@ -23,7 +23,10 @@ TEST(MediaWriter, TakesNullHandlesAndRecords) {
     ASSERT_NE(file, nullptr);
     EXPECT_EQ(MWWriteVideoFrame(file, nullptr), 0);
     EXPECT_EQ(MWWriteAudioData(file, nullptr), 0);
-    EXPECT_EQ(MWCloseMediaFile(file, nullptr, nullptr), 1);
+    EXPECT_EQ(MWCloseMediaFile(file, nullptr, nullptr), 0);
+    EXPECT_EQ(Latest().nState, kWriterFileEmpty);
+    EXPECT_EQ(Latest().nError, kWriterErrorNone);
+    EXPECT_TRUE(folder.Names().empty());
 }
 
 TEST(MediaWriter, RefusesRecordsThatMakeNoSense) {
