@@ -373,7 +373,9 @@ void MediaFile::CloseFailed() {
         RemovePart();
         return;
     }
-    if (part_->Error() == 0 && !muxer_->Empty()) {
+    // Asked for an end without what describes the sound, the multiplexer refuses, and leaks.
+    const bool describable = !NeedsSound(plan_) || muxer_->Stream(soundStream_).packets > 0;
+    if (part_->Error() == 0 && !muxer_->Empty() && describable) {
         try {
             muxer_->WriteTrailer();
             part_->Flush();
