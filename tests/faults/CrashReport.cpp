@@ -69,9 +69,10 @@ void ReportCrashes() {
 
 bool IsKnownCrash(const std::string& output) {
     constexpr std::array kCrashing{" avcodec_alloc_context3 ", " swr_convert ", " av_write_trailer "};
-    constexpr std::array kHiding{" avcodec_open2 "}; // the crash comes with the first picture
+    constexpr std::array kHiding{" avcodec_open2 "};
+    constexpr std::array kFirstPicture{" avcodec_send_frame ", " avcodec_send_packet "};
     return Names(output, "Crash:", kCrashing) ||
-           (Names(output, "Crash:", std::array{" "}) && Names(output, "In:", kHiding));
+           (Names(output, "Crash:", kFirstPicture) && Names(output, "In:", kHiding));
 }
 
 bool WasOpening(const std::string& output) {
