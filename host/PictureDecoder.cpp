@@ -184,7 +184,7 @@ void PictureDecoder::ConsiderMoreThreads(av::Packet packet) {
 
 /// Begins again with more threads and skips the frames that are known, whatever lies between key pictures.
 void PictureDecoder::UseMoreThreads() {
-    threads_ = static_cast<int>(std::min(std::thread::hardware_concurrency() + 1, kMostThreads));
+    threads_ = static_cast<int>(std::min(std::thread::hardware_concurrency(), kMostThreads));
     damagedBefore_ += decoder_->Damaged();
     decoder_ = std::make_unique<StreamDecoder>(*stream_, threads_);
     skip_ = decoded_;
