@@ -5,6 +5,7 @@
 #include <cstdlib>
 #include <fcntl.h>
 #include <pty.h>
+#include <regex>
 #include <sys/wait.h>
 #include <termios.h>
 #include <unistd.h>
@@ -103,11 +104,13 @@ bool Running::ReadSome() {
     return count > 0; // a terminal whose program has ended gives an error
 }
 
-bool Running::WaitFor(const std::string& text) {
+bool Running::WaitFor(const std::string& pattern) {
+    const std::regex regex(pattern);
     for (;;) {
-        const std::size_t at = printed_.find(text, seen_);
-        if (at != std::string::npos) {
-            seen_ = at + text.size();
+        std::smatch match;
+        if (std::regex_search(printed_.cbegin() + static_cast<std::ptrdiff_t>(seen_), printed_.cend(), match,
+                              regex)) {
+            seen_ = static_cast<std::size_t>(match[0].second - printed_.cbegin());
             return true;
         }
         if (!ReadSome()) {

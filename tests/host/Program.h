@@ -29,8 +29,10 @@ public:
     Running& operator=(const Running&) = delete;
     ~Running();
 
-    /// Reads what it prints until `text` has come once more since the last call. False when it ended before.
-    bool WaitFor(const std::string& text);
+    /// Reads what it prints until the regular expression `pattern` has matched once more since the last call.
+    /// False when it ended before. A position can be passed over between two lines of progress: ask for a
+    /// range.
+    bool WaitFor(const std::string& pattern);
 
     /// False when it ended instead.
     bool WaitUntilSuspended() const;
