@@ -61,6 +61,7 @@ TEST_F(LogSink, GoesWhereItWasToldLast) {
     EXPECT_EQ(Log(L"second"), 1);
     EXPECT_EQ(LogSinkSetFile(nullptr), 1);
     EXPECT_EQ(Log(L"third"), 1);
+    EXPECT_EQ(LogSinkSetFile(path.c_str()), 1);
     EXPECT_EQ(LogSinkSetFile(""), 1);
     EXPECT_EQ(Log(L"gone"), 1);
     EXPECT_EQ(testing::internal::GetCapturedStderr(), "first\nthird\n");
