@@ -1,0 +1,84 @@
+// MCStop with the real media writer while the disk takes nothing and every queue before it is full.
+#include "api/MovieConv.h"
+#include "tests/engine/IdleParts.h"
+#include "tests/support/Folder.h"
+#include "tests/support/Gate.h"
+#include "writer/WriterStatus.h"
+
+#include <gtest/gtest.h>
+
+#include <atomic>
+#include <chrono>
+#include <memory>
+#include <thread>
+
+#include <sys/syscall.h>
+#include <unistd.h>
+
+namespace {
+
+Gate g_disk;
+
+std::unique_ptr<WriterStatus> Status() {
+    auto status = std::make_unique<WriterStatus>();
+    MWGetFileStatus(MWGetFileCount(), status.get());
+    return status;
+}
+
+void AwaitPictures(int64_t pictures) {
+    while (Status()->llPicturesWritten < pictures)
+        std::this_thread::sleep_for(std::chrono::milliseconds(1));
+}
+
+/// Until the writer has taken nothing for a while, which says that its caller waits for room.
+void AwaitFullQueues() {
+    int64_t received = -1;
+    for (int unchanged = 0; unchanged < 50; ++unchanged) {
+        const int64_t now = Status()->llPicturesReceived;
+        if (now != received)
+            unchanged = 0;
+        received = now;
+        std::this_thread::sleep_for(std::chrono::milliseconds(5));
+    }
+}
+
+} // namespace
+
+/// In place of the system's, for the media writer too. The program's own output passes.
+extern "C" __attribute__((visibility("default"))) ssize_t write(int descriptor, const void* data,
+                                                                size_t size) {
+    if (descriptor > STDERR_FILENO)
+        g_disk.Pass();
+    return syscall(SYS_write, descriptor, data, size);
+}
+
+TEST(FullQueuesTest, AStopWaitsForTheDiskAndFinishesWhatWasTaken) {
+    const Folder folder;
+    IdleVideo video(1'000'000);
+    IdleAudio audio(2'000'000);
+    MCHandle handle = MCCreate(&video, &audio);
+    MCSetOutputFile(handle, std::filesystem::path(folder / "out.mp4").wstring().c_str());
+    ASSERT_EQ(MCStart(handle, 0.0, 0.0, nullptr, nullptr, nullptr), 0);
+    AwaitPictures(100);
+    g_disk.Shut();
+    g_disk.AwaitHeld();
+    AwaitFullQueues();
+
+    std::atomic<bool> back{false};
+    std::thread stopper([&] {
+        MCStop(handle);
+        back = true;
+    });
+    while (!back && MCPause(handle) != 0) // 0 once the stop has been asked for
+        MCResume(handle);
+    EXPECT_EQ(MCWait(handle, 100), MC_WAIT_TIMEOUT);
+    EXPECT_FALSE(back) << "the disk takes nothing";
+    g_disk.Open();
+    stopper.join();
+    EXPECT_EQ(MCWait(handle, 0), 0);
+    MCDestroy(handle);
+
+    EXPECT_EQ(Status()->nState, kWriterFileComplete);
+    EXPECT_EQ(Status()->llPicturesWritten, Status()->llPicturesReceived);
+    EXPECT_EQ(folder.Names(), std::vector<std::string>{"out.mp4"});
+}
