@@ -374,19 +374,20 @@ class LaneKernels {
             const Vec blue = InPixelOrder(c.blue);
             const Vec green = InPixelOrder(c.green);
             const Vec red = InPixelOrder(c.red);
-            const Vec fourth = V::Set8(-1);
+            const Vec fourth = V::Set8(kOpaque ? -1 : 0);
             const Vec blueGreen[2] = {V::UnpackLo8(blue, green), V::UnpackHi8(blue, green)};
             const Vec redFourth[2] = {V::UnpackLo8(red, fourth), V::UnpackHi8(red, fourth)};
-            Vec quads[4] = {
+            const Vec quads[4] = {
                 V::UnpackLo16(blueGreen[0], redFourth[0]), V::UnpackHi16(blueGreen[0], redFourth[0]),
                 V::UnpackLo16(blueGreen[1], redFourth[1]), V::UnpackHi16(blueGreen[1], redFourth[1])};
             if constexpr (kOpaque) {
                 V::StoreLanes(p, quads);
             } else {
                 const Vec kept = V::Set32(static_cast<int32_t>(0xFF000000));
-                for (int i = 0; i < 4; ++i)
-                    quads[i] = V::Blend8(quads[i], V::LoadLanes(p + 16 * i, 64), kept);
-                V::Cached::StoreLanes(p, quads); // what has been read is in the cache
+                V::ForVectors(quads, [&](ptrdiff_t offset, Vec pixels) {
+                    const Vec target = V::And(V::Load(p + offset), kept);
+                    V::Cached::Store(p + offset, V::Or(pixels, target)); // in the cache, as it was read
+                });
             }
         }
     };

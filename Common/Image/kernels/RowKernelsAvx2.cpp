@@ -23,6 +23,7 @@ struct Avx2 {
     }
 
     static Vec And(Vec a, Vec b) { return _mm256_and_si256(a, b); }
+    static Vec Or(Vec a, Vec b) { return _mm256_or_si256(a, b); }
     static Vec Xor(Vec a, Vec b) { return _mm256_xor_si256(a, b); }
     static Vec Add8(Vec a, Vec b) { return _mm256_add_epi8(a, b); }
     static Vec Add16(Vec a, Vec b) { return _mm256_add_epi16(a, b); }
@@ -103,20 +104,29 @@ struct Avx2 {
     static Vec LowLanes(Vec a, Vec b) { return _mm256_permute2x128_si256(a, b, 0x20); }
     static Vec HighLanes(Vec a, Vec b) { return _mm256_permute2x128_si256(a, b, 0x31); }
 
-    static void StoreLanes(uint8_t* p, const Vec (&parts)[2]) {
-        Store(p, LowLanes(parts[0], parts[1]));
-        Store(p + 32, HighLanes(parts[0], parts[1]));
+    /// Lanes that follow each other through the parts, all low ones and then all high ones, as vectors with
+    /// their offsets in bytes.
+    template <class Take>
+    static void ForVectors(const Vec (&parts)[2], const Take& take) {
+        take(0, LowLanes(parts[0], parts[1]));
+        take(32, HighLanes(parts[0], parts[1]));
     }
-    static void StoreLanes(uint8_t* p, const Vec (&parts)[3]) {
-        Store(p, LowLanes(parts[0], parts[1]));
-        Store(p + 32, _mm256_blend_epi32(parts[2], parts[0], 0xF0));
-        Store(p + 64, HighLanes(parts[1], parts[2]));
+    template <class Take>
+    static void ForVectors(const Vec (&parts)[3], const Take& take) {
+        take(0, LowLanes(parts[0], parts[1]));
+        take(32, _mm256_blend_epi32(parts[2], parts[0], 0xF0));
+        take(64, HighLanes(parts[1], parts[2]));
     }
-    static void StoreLanes(uint8_t* p, const Vec (&parts)[4]) {
-        Store(p, LowLanes(parts[0], parts[1]));
-        Store(p + 32, LowLanes(parts[2], parts[3]));
-        Store(p + 64, HighLanes(parts[0], parts[1]));
-        Store(p + 96, HighLanes(parts[2], parts[3]));
+    template <class Take>
+    static void ForVectors(const Vec (&parts)[4], const Take& take) {
+        take(0, LowLanes(parts[0], parts[1]));
+        take(32, LowLanes(parts[2], parts[3]));
+        take(64, HighLanes(parts[0], parts[1]));
+        take(96, HighLanes(parts[2], parts[3]));
+    }
+    template <size_t kParts>
+    static void StoreLanes(uint8_t* p, const Vec (&parts)[kParts]) {
+        ForVectors(parts, [p](ptrdiff_t offset, Vec a) { Store(p + offset, a); });
     }
     static void FinishPicture() {}
 };

@@ -23,10 +23,14 @@ struct Sse41 {
     static Vec ExchangeMiddle(Vec a) { return a; }
 
     static void Store(uint8_t* p, Vec a) { _mm_storeu_si128(reinterpret_cast<Vec*>(p), a); }
+    template <size_t kParts, class Take>
+    static void ForVectors(const Vec (&parts)[kParts], const Take& take) {
+        for (size_t i = 0; i < kParts; ++i)
+            take(16 * i, parts[i]);
+    }
     template <size_t kParts>
     static void StoreLanes(uint8_t* p, const Vec (&parts)[kParts]) {
-        for (size_t i = 0; i < kParts; ++i)
-            Store(p + 16 * i, parts[i]);
+        ForVectors(parts, [p](size_t offset, Vec a) { Store(p + offset, a); });
     }
     static void StoreHalf(uint8_t* p, Vec a) { _mm_storel_epi64(reinterpret_cast<Vec*>(p), a); }
     static void StoreHalves(uint8_t* low, uint8_t* high, Vec a) {
@@ -47,6 +51,7 @@ struct Sse41 {
     }
 
     static Vec And(Vec a, Vec b) { return _mm_and_si128(a, b); }
+    static Vec Or(Vec a, Vec b) { return _mm_or_si128(a, b); }
     static Vec Xor(Vec a, Vec b) { return _mm_xor_si128(a, b); }
     static Vec Add8(Vec a, Vec b) { return _mm_add_epi8(a, b); }
     static Vec Add16(Vec a, Vec b) { return _mm_add_epi16(a, b); }
