@@ -21,64 +21,64 @@
 #include <cstdint>
 
 namespace image {
+namespace {
 
 /// The contents of one lane, repeated in all.
 using LaneBytes = std::array<int8_t, 16>;
 
-/// What all vector kernels of an instruction set share: the walk over a row's blocks.
+/// Pixels of a block.
 template <class V>
-class LaneBlocks {
-protected:
-    using Vec = typename V::Vec;
-    static constexpr ptrdiff_t kLanes = sizeof(Vec) / 16;
-    static constexpr ptrdiff_t kPixels = 16 * kLanes;
+constexpr ptrdiff_t kLanePixels = sizeof(typename V::Vec);
 
-    /// Calls block(x) so that all columns of an even width are covered, and last(done) for an odd column
-    /// behind them. The width is not less than a block. One place calls the block, so that the compiler keeps
-    /// its constants in registers.
-    template <class Block, class Last>
-    static void ForBlocks(ptrdiff_t width, ptrdiff_t blockPixels, Block block, Last last) {
-        const ptrdiff_t even = width & ~ptrdiff_t{1};
-        const ptrdiff_t lastBlock = even - blockPixels;
-        for (ptrdiff_t x = 0; x < lastBlock; x += blockPixels)
-            block(x);
-        block(lastBlock);
-        if (even < width)
-            last(even);
-    }
+/// Calls block(x) so that all columns of an even width are covered, and last(done) for an odd column
+/// behind them. The width is not less than a block. One place calls the block, so that the compiler keeps
+/// its constants in registers.
+template <class Block, class Last>
+void ForBlocks(ptrdiff_t width, ptrdiff_t blockPixels, Block block, Last last) {
+    const ptrdiff_t even = width & ~ptrdiff_t{1};
+    const ptrdiff_t lastBlock = even - blockPixels;
+    for (ptrdiff_t x = 0; x < lastBlock; x += blockPixels)
+        block(x);
+    block(lastBlock);
+    if (even < width)
+        last(even);
+}
 
-    /// Of an even width.
-    template <class Block>
-    static void ForBlocks(ptrdiff_t width, Block block) {
-        ForBlocks(width, kPixels, block, [](ptrdiff_t) {});
-    }
+/// Of an even width.
+template <class Block>
+void ForBlocks(ptrdiff_t width, ptrdiff_t blockPixels, Block block) {
+    ForBlocks(width, blockPixels, block, [](ptrdiff_t) {});
+}
 
-    /// The size of what is left of a pair of rows.
-    static Size LastColumn(ptrdiff_t row0, ptrdiff_t row1) { return {1, row1 - row0 + 1}; }
+/// The size of what is left of a pair of rows.
+inline Size LastColumn(ptrdiff_t row0, ptrdiff_t row1) {
+    return {1, row1 - row0 + 1};
+}
 
-    static RowPair Advance(RowPair rows, ptrdiff_t bytes) {
-        return {rows.first + bytes, rows.second + bytes};
-    }
-    static PlanesPair Advance(PlanesPair planes, ptrdiff_t columns) {
-        return {Advance(planes.y, columns), planes.u + columns / 2, planes.v + columns / 2};
-    }
+inline RowPair Advance(RowPair rows, ptrdiff_t bytes) {
+    return {rows.first + bytes, rows.second + bytes};
+}
+inline PlanesPair Advance(PlanesPair planes, ptrdiff_t columns) {
+    return {Advance(planes.y, columns), planes.u + columns / 2, planes.v + columns / 2};
+}
 
-    /// Asks for what the blocks a little further on will read: with two rows read and up to six written, the
-    /// processor does not foresee it all. Past the end of a row it does no harm.
-    static void Prefetch(const uint8_t* p, ptrdiff_t blockBytes) {
-        constexpr ptrdiff_t kAhead = 2048;
-        constexpr ptrdiff_t kCacheLine = 64;
-        for (ptrdiff_t i = 0; i < blockBytes; i += kCacheLine)
-            __builtin_prefetch(p + kAhead + i);
-    }
+/// Asks for what the blocks a little further on will read: with two rows read and up to six written, the
+/// processor does not foresee it all. Past the end of a row it does no harm.
+inline void Prefetch(const uint8_t* p, ptrdiff_t blockBytes) {
+    constexpr ptrdiff_t kAhead = 2048;
+    constexpr ptrdiff_t kCacheLine = 64;
+    for (ptrdiff_t i = 0; i < blockBytes; i += kCacheLine)
+        __builtin_prefetch(p + kAhead + i);
+}
 
-    /// Stores the bytes of two vectors alternating.
-    static void StoreInterleaved(uint8_t* p, Vec even, Vec odd) {
-        const Vec halves[2] = {V::UnpackLo8(even, odd), V::UnpackHi8(even, odd)};
-        V::StoreLanes(p, halves);
-    }
-};
+/// Stores the bytes of two vectors alternating.
+template <class V>
+void StoreInterleaved(uint8_t* p, typename V::Vec even, typename V::Vec odd) {
+    const typename V::Vec halves[2] = {V::UnpackLo8(even, odd), V::UnpackHi8(even, odd)};
+    V::StoreLanes(p, halves);
+}
 
+} // namespace
 } // namespace image
 
 #endif

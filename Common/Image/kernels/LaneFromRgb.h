@@ -6,16 +6,12 @@
 #include "Common/Image/kernels/LaneBlocks.h"
 
 namespace image {
+namespace {
 
 template <class V>
-class LaneFromRgb : protected LaneBlocks<V> {
-protected:
-    using typename LaneBlocks<V>::Vec;
-    using LaneBlocks<V>::kPixels;
-    using LaneBlocks<V>::Advance;
-    using LaneBlocks<V>::ForBlocks;
-    using LaneBlocks<V>::LastColumn;
-    using LaneBlocks<V>::Prefetch;
+struct LaneFromRgb {
+    using Vec = typename V::Vec;
+    static constexpr ptrdiff_t kPixels = kLanePixels<V>;
 
     /// Four bytes for every 32 bits, the first lowest.
     static Vec SetBytes(int first, int second, int third, int fourth) {
@@ -177,7 +173,7 @@ protected:
         if (size.width < kPixels)
             return (V::Lower().*kKernel)(target, rgb, size);
         ForRowPairs(target, rgb, size.height,
-                    [&](PlanesPair to, RowPair from, ptrdiff_t row0, ptrdiff_t row1) {
+                    [&](const PlanesPair& to, RowPair from, ptrdiff_t row0, ptrdiff_t row1) {
                         ForBlocks(
                             size.width, kPixels,
                             [&](ptrdiff_t x) {
@@ -195,25 +191,27 @@ protected:
     [[gnu::flatten]] static void RgbaTo420(Planes420 target, Rows alpha, Rows bgra, Size size) {
         if (size.width < kPixels)
             return V::Lower().bgra32To420(target, alpha, bgra, size);
-        ForRowPairs(
-            target, bgra, size.height, [&](PlanesPair to, RowPair from, ptrdiff_t row0, ptrdiff_t row1) {
-                ForBlocks(
-                    size.width, kPixels,
-                    [&](ptrdiff_t x) {
-                        const auto storeAlpha = [&](RowIndex row, const Quads& bytes) {
-                            V::Store(alpha[row == kFirst ? row0 : row1] + x, Bgr32::Alpha(bytes));
-                        };
-                        RgbBlockTo420<Bgr32, FastRgbForm>(Advance(to, x), Advance(from, 4 * x), storeAlpha);
-                    },
-                    [&](ptrdiff_t x) {
-                        kPlainKernels.bgra32To420(target.At(x, row0), alpha.At(row0, x), bgra.At(row0, 4 * x),
-                                                  LastColumn(row0, row1));
+        ForRowPairs(target, bgra, size.height,
+                    [&](const PlanesPair& to, RowPair from, ptrdiff_t row0, ptrdiff_t row1) {
+                        ForBlocks(
+                            size.width, kPixels,
+                            [&](ptrdiff_t x) {
+                                const auto storeAlpha = [&](RowIndex row, const Quads& bytes) {
+                                    V::Store(alpha[row == kFirst ? row0 : row1] + x, Bgr32::Alpha(bytes));
+                                };
+                                RgbBlockTo420<Bgr32, FastRgbForm>(Advance(to, x), Advance(from, 4 * x),
+                                                                  storeAlpha);
+                            },
+                            [&](ptrdiff_t x) {
+                                kPlainKernels.bgra32To420(target.At(x, row0), alpha.At(row0, x),
+                                                          bgra.At(row0, 4 * x), LastColumn(row0, row1));
+                            });
                     });
-            });
         V::FinishPicture();
     }
 };
 
+} // namespace
 } // namespace image
 
 #endif

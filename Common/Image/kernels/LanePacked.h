@@ -6,18 +6,14 @@
 #include "Common/Image/kernels/LaneToRgb.h"
 
 namespace image {
+namespace {
 
 template <class V>
-class LanePacked : protected LaneFromRgb<V>, protected LaneToRgb<V> {
-protected:
-    using typename LaneBlocks<V>::Vec;
-    using LaneBlocks<V>::kPixels;
-    using LaneBlocks<V>::Advance;
-    using LaneBlocks<V>::ForBlocks;
-    using LaneBlocks<V>::LastColumn;
-    using LaneBlocks<V>::StoreInterleaved;
+struct LanePacked {
+    using Vec = typename V::Vec;
     using From = LaneFromRgb<V>;
     using To = LaneToRgb<V>;
+    static constexpr ptrdiff_t kPixels = kLanePixels<V>;
 
     static Vec LowBytes(Vec words) { return V::And(words, V::Set16(0xFF)); }
     static Vec HighBytes(Vec words) { return V::template Srl16<8>(words); }
@@ -40,7 +36,7 @@ protected:
     /// Stores sixteen pixels a lane from their Y and the bytes U, V, U, V, ...
     template <PackedOrder kOrder>
     static void StorePacked(uint8_t* p, Vec y, Vec uv) {
-        StoreInterleaved(p, kOrder == kYuy2 ? y : uv, kOrder == kYuy2 ? uv : y);
+        StoreInterleaved<V>(p, kOrder == kYuy2 ? y : uv, kOrder == kYuy2 ? uv : y);
     }
 
     template <PackedOrder kOrder>
@@ -67,10 +63,12 @@ protected:
     [[gnu::flatten]] static void PackedTo420(Planes420 target, Rows packed, Size size) {
         if (size.width < kPixels)
             return V::Lower().packedTo420[kOrder](target, packed, size);
-        ForRowPairs(target, packed, size.height, [&](PlanesPair to, RowPair from, ptrdiff_t, ptrdiff_t) {
-            ForBlocks(size.width,
-                      [&](ptrdiff_t x) { PackedBlockTo420<kOrder>(Advance(to, x), Advance(from, 2 * x)); });
-        });
+        ForRowPairs(target, packed, size.height,
+                    [&](const PlanesPair& to, RowPair from, ptrdiff_t, ptrdiff_t) {
+                        ForBlocks(size.width, kPixels, [&](ptrdiff_t x) {
+                            PackedBlockTo420<kOrder>(Advance(to, x), Advance(from, 2 * x));
+                        });
+                    });
         V::FinishPicture();
     }
 
@@ -78,15 +76,16 @@ protected:
     [[gnu::flatten]] static void PackedFrom420(Rows packed, Planes420 source, Size size) {
         if (size.width < kPixels)
             return V::Lower().packedFrom420[kOrder](packed, source, size);
-        ForRowPairs(source, packed, size.height, [&](PlanesPair from, RowPair to, ptrdiff_t, ptrdiff_t) {
-            ForBlocks(size.width, [&](ptrdiff_t x) {
-                const PlanesPair at = Advance(from, x);
-                const RowPair groups = Advance(to, 2 * x);
-                const Vec uv = V::LoadAlternating(at.u, at.v);
-                StorePacked<kOrder>(groups.first, V::Load(at.y.first), uv);
-                StorePacked<kOrder>(groups.second, V::Load(at.y.second), uv);
-            });
-        });
+        ForRowPairs(source, packed, size.height,
+                    [&](const PlanesPair& from, RowPair to, ptrdiff_t, ptrdiff_t) {
+                        ForBlocks(size.width, kPixels, [&](ptrdiff_t x) {
+                            const PlanesPair at = Advance(from, x);
+                            const RowPair groups = Advance(to, 2 * x);
+                            const Vec uv = V::LoadAlternating(at.u, at.v);
+                            StorePacked<kOrder>(groups.first, V::Load(at.y.first), uv);
+                            StorePacked<kOrder>(groups.second, V::Load(at.y.second), uv);
+                        });
+                    });
         V::FinishPicture();
     }
 
@@ -145,6 +144,7 @@ protected:
     }
 };
 
+} // namespace
 } // namespace image
 
 #endif

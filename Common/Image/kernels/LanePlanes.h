@@ -5,16 +5,12 @@
 #include "Common/Image/kernels/LaneBlocks.h"
 
 namespace image {
+namespace {
 
 template <class V>
-class LanePlanes : protected LaneBlocks<V> {
-protected:
-    using typename LaneBlocks<V>::Vec;
-    using LaneBlocks<V>::kPixels;
-    using LaneBlocks<V>::Advance;
-    using LaneBlocks<V>::ForBlocks;
-    using LaneBlocks<V>::LastColumn;
-    using LaneBlocks<V>::StoreInterleaved;
+struct LanePlanes {
+    using Vec = typename V::Vec;
+    static constexpr ptrdiff_t kPixels = kLanePixels<V>;
 
     /// Stores to whole vectors of memory, but for both ends of a row: a store across a cache line takes two.
     [[gnu::flatten]] static void Copy(Rows target, Rows source, Size size) {
@@ -98,12 +94,13 @@ protected:
         else
             DoubleBy(kPixels, target, source, size, [](RowPair to, const uint8_t* from) {
                 const Vec samples = V::Load(from);
-                StoreInterleaved(to.first, samples, samples);
-                StoreInterleaved(to.second, samples, samples);
+                StoreInterleaved<V>(to.first, samples, samples);
+                StoreInterleaved<V>(to.second, samples, samples);
             });
     }
 };
 
+} // namespace
 } // namespace image
 
 #endif

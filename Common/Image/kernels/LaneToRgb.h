@@ -6,15 +6,12 @@
 #include "Common/Image/kernels/LaneBlocks.h"
 
 namespace image {
+namespace {
 
 template <class V>
-class LaneToRgb : protected LaneBlocks<V> {
-protected:
-    using typename LaneBlocks<V>::Vec;
-    using LaneBlocks<V>::kPixels;
-    using LaneBlocks<V>::Advance;
-    using LaneBlocks<V>::ForBlocks;
-    using LaneBlocks<V>::LastColumn;
+struct LaneToRgb {
+    using Vec = typename V::Vec;
+    static constexpr ptrdiff_t kPixels = kLanePixels<V>;
 
     /// The chroma terms of sixteen pixels a lane: a word for every two pixels.
     struct ChromaTerms {
@@ -138,26 +135,28 @@ protected:
     [[gnu::flatten]] static void RgbFrom420(Rows rgb, Planes420 source, Size size) {
         if (size.width < kPixels)
             return (V::Lower().*kKernel)(rgb, source, size);
-        ForRowPairs(
-            source, rgb, size.height, [&](PlanesPair from, RowPair to, ptrdiff_t row0, ptrdiff_t row1) {
-                ForBlocks(
-                    size.width, kPixels,
-                    [&](ptrdiff_t x) {
-                        const PlanesPair at = Advance(from, x);
-                        const RowPair pixels = Advance(to, Target::kBytes * x);
-                        const ChromaTerms terms = MakeTerms<Form>(V::LoadAlternating(at.u, at.v));
-                        Target::Store(pixels.first, MakeComponents<Form>(V::Load(at.y.first), terms));
-                        Target::Store(pixels.second, MakeComponents<Form>(V::Load(at.y.second), terms));
-                    },
-                    [&](ptrdiff_t x) {
-                        (kPlainKernels.*kKernel)(rgb.At(row0, Target::kBytes * x), source.At(x, row0),
-                                                 LastColumn(row0, row1));
+        ForRowPairs(source, rgb, size.height,
+                    [&](const PlanesPair& from, RowPair to, ptrdiff_t row0, ptrdiff_t row1) {
+                        ForBlocks(
+                            size.width, kPixels,
+                            [&](ptrdiff_t x) {
+                                const PlanesPair at = Advance(from, x);
+                                const RowPair pixels = Advance(to, Target::kBytes * x);
+                                const ChromaTerms terms = MakeTerms<Form>(V::LoadAlternating(at.u, at.v));
+                                Target::Store(pixels.first, MakeComponents<Form>(V::Load(at.y.first), terms));
+                                Target::Store(pixels.second,
+                                              MakeComponents<Form>(V::Load(at.y.second), terms));
+                            },
+                            [&](ptrdiff_t x) {
+                                (kPlainKernels.*kKernel)(rgb.At(row0, Target::kBytes * x), source.At(x, row0),
+                                                         LastColumn(row0, row1));
+                            });
                     });
-            });
         V::FinishPicture();
     }
 };
 
+} // namespace
 } // namespace image
 
 #endif

@@ -155,10 +155,10 @@ struct Avx2Large : Avx2 {
     static void FinishPicture() { _mm_sfence(); }
 };
 
-constexpr RowKernels kLargeKernels = LaneKernels<Avx2Large>::Table();
+constexpr RowKernels kLargeKernels = MakeLaneKernels<Avx2Large>();
 
 } // namespace
 
-constinit const RowKernels kAvx2Kernels = LaneKernels<Avx2>::Table(&kLargeKernels);
+constinit const RowKernels kAvx2Kernels = MakeLaneKernels<Avx2>(&kLargeKernels);
 
 } // namespace image

@@ -103,6 +103,6 @@ struct Sse41 {
 
 } // namespace
 
-constinit const RowKernels kSse41Kernels = LaneKernels<Sse41>::Table();
+constinit const RowKernels kSse41Kernels = MakeLaneKernels<Sse41>();
 
 } // namespace image
