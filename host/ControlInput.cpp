@@ -61,7 +61,9 @@ void WriteAll(int descriptor, const std::string& text) {
 ControlInput::ControlInput() {
     const sigset_t ours = OurSignals();
     pthread_sigmask(SIG_BLOCK, &ours, nullptr);
-    std::signal(SIGPIPE, SIG_IGN);
+    for (const int failure : {SIGPIPE, SIGXFSZ}) { // the write that fails tells it
+        std::signal(failure, SIG_IGN);
+    }
     signals_ = signalfd(-1, &ours, SFD_CLOEXEC);
     wake_ = eventfd(0, EFD_CLOEXEC);
     thread_ = std::thread(&ControlInput::Run, this);

@@ -13,6 +13,7 @@
 #include <filesystem>
 #include <fstream>
 #include <set>
+#include <sys/resource.h>
 #include <sys/stat.h>
 #include <thread>
 
@@ -80,6 +81,20 @@ TEST(OutputFault, ARemovedFolderEndsTheConversionSoon) {
     EXPECT_NE(result.out.find("No such file or directory"), std::string::npos) << result.out;
     EXPECT_EQ(result.out.find("is in \""), std::string::npos) << "nothing is left: " << result.out;
     EXPECT_EQ(result.out.find("0:00:20 / "), std::string::npos) << "not all was converted for nothing";
+}
+
+TEST(OutputFault, ALimitOfTheFileSizeIsTold) {
+    const Folder folder;
+    const std::string source = Long("mkv");
+    rlimit usual{};
+    ASSERT_EQ(getrlimit(RLIMIT_FSIZE, &usual), 0);
+    const rlimit small{500'000, usual.rlim_max}; // for the program, which inherits it
+    ASSERT_EQ(setrlimit(RLIMIT_FSIZE, &small), 0);
+    const Result result = Call({source, folder / "out.mp4"});
+    setrlimit(RLIMIT_FSIZE, &usual);
+    EXPECT_EQ(result.code, 4) << result.err;
+    EXPECT_NE(result.err.find("File too large; what was"), std::string::npos) << result.err;
+    EXPECT_GT(PicturesIn(folder / "out.mp4.part"), 25u);
 }
 
 TEST(LogFault, AFullOrMissingPlaceForTheLogIsNoHarm) {
