@@ -70,13 +70,14 @@ bool FileLedger::Enter(const WriterWatch::News& news) {
     switch (news.event) {
     case kWriterEventOpened:
         ++opened_;
+        finishing_.reset();
         reporter_.FileOpened(opened_, news.status.szPath);
         break;
     case kWriterEventFinishing:
         finishing_ = news.status.dFinished;
         break;
     case kWriterEventClosed:
-        finishing_.reset();
+        finishing_ = 1; // until the next clip or the end
         EnterClosed(news.status);
         break;
     default:

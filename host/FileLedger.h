@@ -23,7 +23,7 @@ public:
     int Complete() const { return complete_; }
     int64_t Bytes() const { return bytes_; } ///< Of the complete files.
 
-    /// How much of the open file's finishing is done, 0 to 1; nothing when none is being finished.
+    /// How much of the last file's finishing is done, 0 to 1; nothing while it takes pictures and sound.
     std::optional<double> Finishing() const { return finishing_; }
 
     /// What went wrong first; nothing when all is well.

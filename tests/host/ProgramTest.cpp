@@ -238,6 +238,8 @@ TEST(Program, PrintsValidJsonAndNothingElse) {
         "assert kinds[0] == 'start' and kinds[-1] == 'end'\n"
         "assert kinds.count('clip_opened') == kinds.count('clip_closed') >= 2\n"
         "assert events[-1]['exit_code'] == 0 and events[-1]['outcome'] == 'done'\n"
+        "last = len(kinds) - kinds[::-1].index('clip_closed')\n"
+        "assert all(e['phase'] == 'finishing' for e in events[last:-1])\n"
         "assert all(e['percent'] < 100 for e in events if e['event'] == 'progress')\n";
     EXPECT_EQ(program::Run({"python3", "-c", check, folder / "events"}).code, 0) << result.out;
     EXPECT_NE(ReadFile(folder / "log").find("Encoding thread Exit."), std::string::npos);
