@@ -29,9 +29,10 @@ std::string Describe(const SourceInfo& source) {
                                    source.durationKnown ? FormatTime(source.duration, true) : "unknown");
     text += source.pictures ? DescribePictures(*source.pictures) : "pictures:  none\n";
     if (source.sound) {
-        text += fmt::format("sound:     {}, {} Hz, {} ({} channels), {}\n", source.sound->codec,
-                            source.sound->sampleRate, source.sound->layout, source.sound->channels,
-                            FormatTime(source.sound->duration, true));
+        const int channels = source.sound->channels;
+        text += fmt::format("sound:     {}, {} Hz, {} ({} channel{}), {}\n", source.sound->codec,
+                            source.sound->sampleRate, source.sound->layout, channels,
+                            channels == 1 ? "" : "s", FormatTime(source.sound->duration, true));
     } else {
         text += "sound:     none\n";
     }

@@ -87,7 +87,7 @@ double LengthToConvert(const Options& options, const SourceInfo& source) {
     const double rest = source.duration - options.begin;
     if (rest <= 0 && source.durationKnown) {
         throw Failure(ExitCode::kUsage,
-                      fmt::format("--begin lies behind the end of \"{}\", which is {:.3f} s long",
+                      fmt::format("--begin is not before the end of \"{}\", which is {:.3f} s long",
                                   source.path, source.duration));
     }
     if (!options.length) {

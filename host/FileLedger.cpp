@@ -33,6 +33,9 @@ std::string TextOf(const WriterStatus& failure) {
     std::string text =
         fmt::format("cannot write \"{}\": {}", failure.szPath,
                     failure.szWhat[0] != '\0' ? failure.szWhat : "the media writer gave no reason");
+    if (text.back() == '.') { // the writer's sentence goes on below
+        text.pop_back();
+    }
     if (failure.nSystemError != 0 &&
         std::strstr(failure.szWhat, std::strerror(failure.nSystemError)) == nullptr) {
         text += fmt::format(" ({})", std::strerror(failure.nSystemError));

@@ -57,6 +57,14 @@ std::string CodecList(const uint32_t (&codes)[N]) {
     return list.empty() ? "none" : list;
 }
 
+/// "mp4,m4v" as ".mp4, .m4v".
+std::string ExtensionList(std::string list) {
+    for (std::size_t comma = list.find(','); comma != std::string::npos; comma = list.find(',', comma + 1)) {
+        list.replace(comma, 1, ", .");
+    }
+    return "." + list;
+}
+
 } // namespace
 
 const FileFormatInfo* FindFormat(std::string_view name) {
@@ -96,8 +104,8 @@ std::string CodeName(uint32_t code) {
 std::string ListFormats() {
     std::string text;
     FindIf([&](const FileFormatInfo& format) {
-        fmt::format_to(std::back_inserter(text), "{:<5} {} (.{})\n", CodeName(format.fccFormat),
-                       format.szName, format.szExtensions);
+        fmt::format_to(std::back_inserter(text), "{:<5} {} ({})\n", CodeName(format.fccFormat), format.szName,
+                       ExtensionList(format.szExtensions));
         if (format.bHasVideo != 0) {
             fmt::format_to(std::back_inserter(text), "      pictures: {}\n",
                            CodecList(format.fccVideoCodecs));

@@ -28,7 +28,18 @@ CLI::Option* AddParsed(CLI::App& app, const std::string& names,
 template <class Value>
 CLI::Option* AddChoice(CLI::App& app, const std::string& name, Value& target,
                        const std::map<std::string, Value>& choices, const std::string& help) {
-    return app.add_option(name, target, help)->transform(CLI::CheckedTransformer(choices).description(""));
+    std::string list;
+    for (const auto& [word, value] : choices) {
+        list += (list.empty() ? "" : "|") + word;
+    }
+    const auto take = [name, &target, choices, list](const std::string& text) {
+        const auto choice = choices.find(text);
+        if (choice == choices.end()) {
+            throw CLI::ValidationError(name, fmt::format("\"{}\" is not {}", text, list));
+        }
+        target = choice->second;
+    };
+    return app.add_option_function<std::string>(name, take, help)->type_name(list);
 }
 
 void AddEncoding(CLI::App& app, Options& options) {
@@ -55,14 +66,13 @@ void AddPictures(CLI::App& app, Options& options) {
         ->group(group);
     AddChoice<Fit>(app, "--fit", options.fit, {{"borders", Fit::kBorders}, {"stretch", Fit::kStretch}},
                    "How pictures of another shape fill it: with borders\n(default) or by stretching")
-        ->type_name("borders|stretch")
         ->group(group);
     AddParsed(app, "--frame-rate", ParseFrameRate, options.frameRate, "a frame rate such as 25 or 30000/1001",
               "Pictures per second; by default the source's")
         ->type_name("N")
         ->group(group);
     AddParsed(app, "--video-rate", ParseRate, options.videoRate, "a bit rate such as 512k or 1.5M",
-              "Bits per second (default 512k)")
+              "Bits per second, as 1.5M (default 512k)")
         ->type_name("RATE")
         ->group(group);
     AddParsed(app, "--video-max-rate", ParseRate, options.videoMaxRate, "a bit rate such as 512k or 1.5M",
@@ -93,7 +103,8 @@ void AddSound(CLI::App& app, Options& options) {
 
 void AddRange(CLI::App& app, Options& options) {
     const std::string group = "What to convert";
-    AddParsed(app, "--begin", ParseTime, options.begin, "a time such as 83.5 or 0:01:23.5", "Begin here")
+    AddParsed(app, "--begin", ParseTime, options.begin, "a time such as 83.5 or 0:01:23.5",
+              "Begin here; TIME is seconds or h:mm:ss.fff")
         ->type_name("TIME")
         ->group(group);
     AddParsed(app, "--length", ParseTime, options.length, "a time such as 83.5 or 0:01:23.5",
@@ -112,7 +123,6 @@ void AddOutput(CLI::App& app, Options& options) {
         ->group(group);
     AddChoice<OnFull>(app, "--on-full", options.onFull, {{"stop", OnFull::kStop}, {"wait", OnFull::kWait}},
                       "On a full disk: stop (default), or wait until there is\nroom again")
-        ->type_name("stop|wait")
         ->group(group);
     app.add_flag_callback(
            "--keep-partial", [&] { options.keepPartial = true; },
@@ -133,7 +143,6 @@ void AddReports(CLI::App& app, Options& options) {
         app, "--progress", options.progress,
         {{"bar", ProgressStyle::kBar}, {"json", ProgressStyle::kJson}, {"none", ProgressStyle::kNone}},
         "A live line, or plain lines without a terminal (bar,\nthe default); one JSON object a line; or none")
-        ->type_name("bar|json|none")
         ->group(group);
     app.add_flag("-q,--quiet", options.quiet, "Print nothing but errors")->group(group);
     app.add_option("--log", options.log, "Append the engine's log to this file")

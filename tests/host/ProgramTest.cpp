@@ -204,6 +204,7 @@ TEST(Program, RefusesAndLeavesEverythingAsItWas) {
         {{folder / "head.mp4", folder / "there.mp4", "-y"}, 3, "nothing to convert"},
         {{source, folder / "out.mp4", "--begin", "9"}, 2, "--begin"},
         {{source, folder / "out.mp4", "--begin", "soon"}, 2, "soon"},
+        {{source, folder / "out.mp4", "--fit", "wide"}, 2, "\"wide\" is not borders|stretch"},
         {{source, folder / "out.webm", "--video-codec", "XVID"}, 2, "XVID"},
         {{source, folder / "out.mp4", "--no-video", "--no-audio"}, 2, "--no-audio"},
         {{source, folder / "out.mp3", "--no-audio"}, 2, "MP3"},
