@@ -7,7 +7,9 @@
 #include <chrono>
 #include <cstdint>
 #include <limits>
+#include <memory>
 #include <thread>
+#include <utility>
 #include <vector>
 
 namespace {
@@ -16,31 +18,35 @@ constexpr OSType kClass = 5000;
 constexpr EventParamName kName = 0x5750414D;
 constexpr EventParamType kType = 0x55494E54;
 
-EventRef NewEvent(OSType eventClass, UInt32 kind) {
+using Event = std::unique_ptr<OpaqueEventRef, decltype(&ReleaseEvent)>;
+
+Event NewEvent(OSType eventClass, UInt32 kind) {
     EventRef event = nullptr;
     EXPECT_EQ(CreateEvent(nullptr, eventClass, kind, 0.0, 0, &event), noErr);
-    return event;
+    return {event, ReleaseEvent};
 }
 
-OSStatus Post(EventRef event, EventPriority priority = kEventPriorityStandard) {
-    return PostEventToQueue(GetMainEventQueue(), event, priority);
+OSStatus Post(const Event& event, EventPriority priority = kEventPriorityStandard) {
+    return PostEventToQueue(GetMainEventQueue(), event.get(), priority);
 }
 
 /// Posts a new event that only the queue owns.
 void PostNew(UInt32 kind, EventPriority priority = kEventPriorityStandard, OSType eventClass = kClass) {
-    const EventRef event = NewEvent(eventClass, kind);
-    EXPECT_EQ(Post(event, priority), noErr);
-    ReleaseEvent(event);
+    EXPECT_EQ(Post(NewEvent(eventClass, kind), priority), noErr);
 }
 
-/// The kind of the next event, which is freed, or -1 when none waits.
-int64_t NextKind(EventTimeout timeout = kEventDurationNoWait) {
+/// The next event of the types that are wanted, of any if there are none; null when none waits.
+Event Receive(const std::vector<EventTypeSpec>& wanted = {}, EventTimeout timeout = kEventDurationNoWait) {
     EventRef event = nullptr;
-    if (ReceiveNextEvent(0, nullptr, timeout, 1, &event) != noErr)
-        return -1;
-    const UInt32 kind = GetEventKind(event);
-    ReleaseEvent(event);
-    return kind;
+    const OSStatus status = ReceiveNextEvent(wanted.size(), wanted.data(), timeout, 1, &event);
+    EXPECT_EQ(status, event ? noErr : eventLoopTimedOutErr);
+    return {event, ReleaseEvent};
+}
+
+/// The kind of the next event, or -1 when none waits.
+int64_t NextKind(EventTimeout timeout = kEventDurationNoWait) {
+    const Event event = Receive({}, timeout);
+    return event ? int64_t{GetEventKind(event.get())} : -1;
 }
 
 class EventQueue : public testing::Test {
@@ -52,7 +58,8 @@ protected:
 };
 
 TEST_F(EventQueue, EventsCarryClassKindAndParameters) {
-    const EventRef event = NewEvent(kClass, 7);
+    const Event owner = NewEvent(kClass, 7);
+    const EventRef event = owner.get();
     EXPECT_EQ(GetEventClass(event), kClass);
     EXPECT_EQ(GetEventKind(event), 7U);
 
@@ -83,11 +90,11 @@ TEST_F(EventQueue, EventsCarryClassKindAndParameters) {
     EXPECT_EQ(size, 0U);
     EXPECT_EQ(GetEventParameter(event, kName + 2, kType, nullptr, 12, &size, got.data()),
               eventParameterNotFoundErr);
-    ReleaseEvent(event);
 }
 
 TEST_F(EventQueue, RefusesWhatMakesNoSense) {
-    const EventRef event = NewEvent(kClass, 1);
+    const Event owner = NewEvent(kClass, 1);
+    const EventRef event = owner.get();
     EventRef out = nullptr;
     EXPECT_EQ(CreateEvent(nullptr, kClass, 1, 0.0, 0, nullptr), paramErr);
     EXPECT_EQ(SetEventParameter(nullptr, kName, kType, 4, &out), paramErr);
@@ -96,9 +103,9 @@ TEST_F(EventQueue, RefusesWhatMakesNoSense) {
               memFullErr);
     EXPECT_EQ(GetEventParameter(nullptr, kName, kType, nullptr, 0, nullptr, nullptr), paramErr);
     EXPECT_EQ(PostEventToQueue(nullptr, event, kEventPriorityStandard), paramErr);
-    EXPECT_EQ(Post(nullptr), paramErr);
-    EXPECT_EQ(Post(event, -1), paramErr);
-    EXPECT_EQ(Post(event, 3), paramErr);
+    EXPECT_EQ(Post({nullptr, ReleaseEvent}), paramErr);
+    EXPECT_EQ(Post(owner, -1), paramErr);
+    EXPECT_EQ(Post(owner, 3), paramErr);
     EXPECT_EQ(ReceiveNextEvent(0, nullptr, 0.0, 1, nullptr), paramErr);
     EXPECT_EQ(ReceiveNextEvent(1, nullptr, 0.0, 1, &out), paramErr);
     EXPECT_EQ(ReceiveNextEvent(0, nullptr, 0.0, 1, &out), eventLoopTimedOutErr);
@@ -106,7 +113,6 @@ TEST_F(EventQueue, RefusesWhatMakesNoSense) {
     EXPECT_EQ(GetEventKind(nullptr), 0U);
     EXPECT_EQ(RetainEvent(nullptr), nullptr);
     ReleaseEvent(nullptr);
-    ReleaseEvent(event);
 }
 
 TEST_F(EventQueue, IsFirstInFirstOutWithinAPriority) {
@@ -124,60 +130,48 @@ TEST_F(EventQueue, GivesOutOnlyTheTypesAskedFor) {
     PostNew(1, kEventPriorityHigh, kClass + 1);
     PostNew(2);
     PostNew(3);
-    const EventTypeSpec wanted[] = {{kClass, 3}, {kClass + 1, 2}};
-    EventRef event = nullptr;
-    ASSERT_EQ(ReceiveNextEvent(2, wanted, kEventDurationNoWait, 1, &event), noErr);
-    EXPECT_EQ(GetEventKind(event), 3U);
-    ReleaseEvent(event);
-    EXPECT_EQ(ReceiveNextEvent(2, wanted, kEventDurationNoWait, 1, &event), eventLoopTimedOutErr);
-    EXPECT_EQ(event, nullptr);
+    const std::vector<EventTypeSpec> wanted{{kClass, 3}, {kClass + 1, 2}};
+    EXPECT_EQ(GetEventKind(Receive(wanted).get()), 3U);
+    EXPECT_EQ(Receive(wanted), nullptr);
     EXPECT_EQ(NextKind(), 1);
     EXPECT_EQ(NextKind(), 2);
 }
 
 TEST_F(EventQueue, LeavesAnEventThatIsNotPulled) {
-    const EventRef event = NewEvent(kClass, 1);
+    const Event event = NewEvent(kClass, 1);
     ASSERT_EQ(Post(event), noErr);
     EventRef seen = nullptr;
     EXPECT_EQ(ReceiveNextEvent(0, nullptr, kEventDurationNoWait, 0, &seen), noErr);
-    EXPECT_EQ(seen, event);
-    EXPECT_EQ(ReceiveNextEvent(0, nullptr, kEventDurationNoWait, 1, &seen), noErr);
-    EXPECT_EQ(seen, event);
-    ReleaseEvent(seen);
+    EXPECT_EQ(seen, event.get());
+    EXPECT_EQ(Receive(), event);
     EXPECT_EQ(NextKind(), -1);
-    ReleaseEvent(event);
 }
 
 TEST_F(EventQueue, TakesAnEventOnceAtATime) {
-    const EventRef event = NewEvent(kClass, 1);
+    const Event event = NewEvent(kClass, 1);
     EXPECT_EQ(Post(event), noErr);
     EXPECT_EQ(Post(event, kEventPriorityHigh), eventAlreadyPostedErr);
     EXPECT_EQ(NextKind(), 1);
     EXPECT_EQ(Post(event), noErr);
     EXPECT_EQ(NextKind(), 1);
     EXPECT_EQ(NextKind(), -1);
-    ReleaseEvent(event);
 }
 
 TEST_F(EventQueue, KeepsItsOwnReference) {
     PostNew(1); // the poster's reference is gone by now
-    EventRef event = nullptr;
-    ASSERT_EQ(ReceiveNextEvent(0, nullptr, kEventDurationNoWait, 1, &event), noErr);
-    EXPECT_EQ(RetainEvent(event), event);
-    ReleaseEvent(event);
-    EXPECT_EQ(GetEventKind(event), 1U);
-    ReleaseEvent(event);
+    const Event event = Receive();
+    EXPECT_EQ(RetainEvent(event.get()), event.get());
+    ReleaseEvent(event.get());
+    EXPECT_EQ(GetEventKind(event.get()), 1U);
 }
 
 TEST_F(EventQueue, RefusesMoreThanItHolds) {
     for (UInt32 kind = 0; kind < 16384; ++kind)
         PostNew(kind);
-    const EventRef event = NewEvent(kClass, 99999);
+    const Event event = NewEvent(kClass, 99999);
     EXPECT_EQ(Post(event), eventQueueFullErr);
     EXPECT_EQ(NextKind(), 0);
     EXPECT_EQ(Post(event), noErr);
-    EXPECT_EQ(Post(event), eventAlreadyPostedErr);
-    ReleaseEvent(event);
 }
 
 TEST_F(EventQueue, WaitsNoLongerThanAsked) {
@@ -193,11 +187,7 @@ TEST_F(EventQueue, WakesAReceiverOfAnyPatience) {
             PostNew(8, kEventPriorityStandard, kClass + 1); // not the one that is waited for
             PostNew(9);
         });
-        const EventTypeSpec wanted{kClass, 9};
-        EventRef event = nullptr;
-        EXPECT_EQ(ReceiveNextEvent(1, &wanted, timeout, 1, &event), noErr);
-        EXPECT_EQ(GetEventKind(event), 9U);
-        ReleaseEvent(event);
+        EXPECT_EQ(GetEventKind(Receive({{kClass, 9}}, timeout).get()), 9U);
         poster.join();
         EXPECT_EQ(NextKind(), 8);
     }
@@ -214,25 +204,22 @@ TEST_F(EventQueue, LosesNothingBetweenThreads) {
         });
 
     std::atomic<UInt32> received{0};
-    std::atomic<bool> inOrder{true};
     for (int receiver = 0; receiver < 2; ++receiver)
-        threads.emplace_back([&] {
+        threads.emplace_back([&received] {
             std::array<int64_t, kPosters> last{-1, -1, -1};
             while (received < kPosters * kEvents) {
                 const int64_t kind = NextKind(0.01);
                 if (kind < 0)
                     continue;
                 ++received;
-                int64_t& previous = last[static_cast<std::size_t>(kind >> 16)];
-                if ((kind & 0xFFFF) <= previous)
-                    inOrder = false;
-                previous = kind & 0xFFFF;
+                const int64_t previous =
+                    std::exchange(last.at(static_cast<size_t>(kind >> 16)), kind & 0xFFFF);
+                EXPECT_GT(kind & 0xFFFF, previous) << "out of order";
             }
         });
     for (std::thread& thread : threads)
         thread.join();
     EXPECT_EQ(received, kPosters * kEvents);
-    EXPECT_TRUE(inOrder);
     EXPECT_EQ(NextKind(), -1);
 }
 
