@@ -7,6 +7,7 @@
 #include <memory>
 #include <string>
 #include <thread>
+#include <utility>
 #include <vector>
 
 #include <unistd.h>
@@ -40,6 +41,8 @@ int __wrap_pthread_join(pthread_t thread, void** result) {
 
 namespace {
 
+using Events = std::pair<bool, bool>; // whether stop and exit are set
+
 /// A worker that runs until it is stopped, or returns at once.
 class Worker : public BaseThread {
 public:
@@ -54,9 +57,12 @@ public:
         SettleState();
     }
 
+    using BaseThread::thread_func;
+
     int State() const { return nState; }
-    bool StopIsSet() const { return hStopEvent->Wait(0) == kWaitSignalled; }
-    bool ExitIsSet() const { return hExitEvent->Wait(0) == kWaitSignalled; }
+    Events SetEvents() const {
+        return {hStopEvent->Wait(0) == kWaitSignalled, hExitEvent->Wait(0) == kWaitSignalled};
+    }
 
     std::atomic<int> runs{0};
 
@@ -80,32 +86,19 @@ protected:
         g_failCreation = false;
         g_created = 0;
         g_joined = 0;
-        testing::internal::CaptureStdout();
     }
-    ~BaseThreadTest() override {
-        testing::internal::GetCapturedStdout();
-        EXPECT_EQ(g_created, g_joined) << "every worker is joined exactly once";
-    }
-
-    static std::string Printed() {
-        fflush(stdout);
-        std::string text = testing::internal::GetCapturedStdout();
-        testing::internal::CaptureStdout();
-        return text;
-    }
+    ~BaseThreadTest() override { EXPECT_EQ(g_created, g_joined) << "every worker is joined exactly once"; }
 };
 
 TEST_F(BaseThreadTest, RunsUntilItIsAborted) {
     Worker worker;
     EXPECT_EQ(worker.State(), kStateIdle);
-    EXPECT_TRUE(worker.StopIsSet());
-    EXPECT_TRUE(worker.ExitIsSet());
+    EXPECT_EQ(worker.SetEvents(), Events(true, true));
     EXPECT_EQ(worker.Abort(), 0);
     EXPECT_EQ(worker.Wait(kWaitInfinite), kWaitSignalled);
     ASSERT_EQ(worker.Start(), 1);
     EXPECT_EQ(worker.State(), kStateRunning);
-    EXPECT_FALSE(worker.StopIsSet());
-    EXPECT_FALSE(worker.ExitIsSet());
+    EXPECT_EQ(worker.SetEvents(), Events(false, false));
     EXPECT_EQ(worker.Start(), 0);
     EXPECT_EQ(worker.Wait(0), kWaitTimeout);
     EXPECT_EQ(worker.Wait(20), kWaitTimeout);
@@ -114,8 +107,7 @@ TEST_F(BaseThreadTest, RunsUntilItIsAborted) {
     EXPECT_EQ(worker.Wait(kWaitInfinite), kWaitSignalled);
     EXPECT_EQ(worker.State(), kStateFinished);
     EXPECT_EQ(g_joined, 1);
-    EXPECT_TRUE(worker.StopIsSet());
-    EXPECT_TRUE(worker.ExitIsSet());
+    EXPECT_EQ(worker.SetEvents(), Events(true, true));
     EXPECT_EQ(worker.Abort(), 0);
     EXPECT_EQ(worker.runs, 1);
 }
@@ -126,7 +118,7 @@ TEST_F(BaseThreadTest, ABodyThatReturnsAtOnceEndsAsFinished) {
         ASSERT_EQ(worker.Start(), 1);
         while (worker.State() != kStateFinished)
             usleep(1000);
-        EXPECT_FALSE(worker.StopIsSet());
+        EXPECT_EQ(worker.SetEvents(), Events(false, true));
         EXPECT_EQ(worker.runs, start);
         if (start % 2 == 0) {
             EXPECT_EQ(worker.Wait(kWaitInfinite), kWaitSignalled);
@@ -156,8 +148,7 @@ TEST_F(BaseThreadTest, StartReportsAThreadThatCannotBeMade) {
         g_failCreation = true;
         EXPECT_EQ(worker.Start(), 0);
         EXPECT_EQ(worker.State(), before);
-        EXPECT_TRUE(worker.StopIsSet());
-        EXPECT_TRUE(worker.ExitIsSet());
+        EXPECT_EQ(worker.SetEvents(), Events(true, true));
         EXPECT_EQ(worker.Wait(kWaitInfinite), kWaitSignalled);
         g_failCreation = false;
         ASSERT_EQ(worker.Start(), 1);
@@ -166,12 +157,7 @@ TEST_F(BaseThreadTest, StartReportsAThreadThatCannotBeMade) {
     }
 }
 
-TEST_F(BaseThreadTest, BeginThreadReturnsNullWhenThereIsNoThread) {
-    g_failCreation = true;
-    EXPECT_EQ(_beginthreadex(
-                  nullptr, 0, [](void* arg) { return arg; }, nullptr, 0, nullptr),
-              nullptr);
-    g_failCreation = false;
+TEST_F(BaseThreadTest, BeginThreadGivesAThreadToJoin) {
     unsigned threadId = 77;
     int value = 0;
     const std::unique_ptr<pthread_t> thread(_beginthreadex(
@@ -183,41 +169,22 @@ TEST_F(BaseThreadTest, BeginThreadReturnsNullWhenThereIsNoThread) {
     EXPECT_EQ(threadId, 77U);
 }
 
-/// Shows the entry and the default body, which polls without sleeping.
-class DefaultBody : public BaseThread {
-public:
-    static void* Enter(void* arg) { return thread_func(arg); }
-};
-
-TEST_F(BaseThreadTest, TheDefaultBodyEndsWhenAsked) {
-    EXPECT_EQ(DefaultBody::Enter(nullptr), nullptr);
-    DefaultBody worker;
-    ASSERT_EQ(worker.Start(), 1);
-    EXPECT_EQ(worker.Wait(0), kWaitTimeout);
-    EXPECT_EQ(worker.Abort(), 1);
-    EXPECT_EQ(worker.Wait(kWaitInfinite), kWaitSignalled);
-}
-
-TEST_F(BaseThreadTest, PrintsItsLines) {
-    Printed();
+TEST_F(BaseThreadTest, TheDefaultBodyEndsWhenAskedAndLinesAreWritten) {
+    EXPECT_EQ(Worker::thread_func(nullptr), nullptr);
+    testing::internal::CaptureStdout();
+    char address[32];
     {
-        BaseThread worker;
-        char address[32];
+        BaseThread worker; // polls without sleeping
         snprintf(address, sizeof address, "[0x%x]",
                  static_cast<unsigned>(reinterpret_cast<uintptr_t>(&worker)));
-        EXPECT_EQ(Printed(), "ThreadEngine::ThreadEngine() " + std::string(address) + "...\r\n");
         worker.Wait(0); // nothing runs, nothing to tell
-        EXPECT_EQ(Printed(), "");
-        worker.Start();
-        worker.Wait(0);
-        EXPECT_EQ(Printed(), "ThreadEngine::Wait() ...\r\nThreadEngine::Wait() S_OK\r\n");
+        EXPECT_EQ(worker.Start(), 1);
+        EXPECT_EQ(worker.Wait(0), kWaitTimeout);
     }
-    const std::string end = Printed();
-    EXPECT_EQ(
-        end.rfind(
-            "ThreadEngine::Wait() ...\r\nThreadEngine::Wait() S_OK\r\nThreadEngine::~ThreadEngine() [0x", 0),
-        0U)
-        << end;
+    const std::string wait = "ThreadEngine::Wait() ...\r\nThreadEngine::Wait() S_OK\r\n";
+    EXPECT_EQ(testing::internal::GetCapturedStdout(),
+              std::string("ThreadEngine::ThreadEngine() ") + address + "...\r\n" + wait + wait +
+                  "ThreadEngine::~ThreadEngine() " + address + "\r\n");
 }
 
 TEST_F(BaseThreadTest, WhoeverWaitsReturnsOnlyAfterTheWorkerIsGone) {
