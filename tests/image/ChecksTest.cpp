@@ -23,75 +23,48 @@ void ExpectFailedCheck(const std::function<void()>& call, unsigned line, const s
         << "line " << line;
 }
 
-using ToYuv = void (*)(unsigned char*, unsigned char*, unsigned char*, int, int, int, tagBITMAPINFOHEADER*,
-                       unsigned char*);
-using ToRgb = void (*)(tagBITMAPINFOHEADER*, unsigned char*, unsigned char*, unsigned char*, unsigned char*,
-                       int, int, int);
+using Convert = void (*)(tagBITMAPINFOHEADER* header, unsigned char* bits, unsigned char* y, unsigned char* u,
+                         unsigned char* v);
 
-void Rgb32ToYuvWithAlpha(unsigned char* y, unsigned char* u, unsigned char* v, int, int, int,
-                         tagBITMAPINFOHEADER* header, unsigned char* bits) {
-    Rgb32_2_yuv420A(y, u, v, kSome, 1, 1, 1, header, bits, 1);
-}
+// The table reads best with each call spelled out in the same few words.
+#define RUN(call)                                                                                            \
+    [](tagBITMAPINFOHEADER* header, unsigned char* bits, unsigned char* y, unsigned char* u,                 \
+       unsigned char* v) { call; }
 
-void Rgb32ToYuvWithAlphaR(unsigned char* y, unsigned char* u, unsigned char* v, int, int, int,
-                          tagBITMAPINFOHEADER* header, unsigned char* bits) {
-    Rgb32_2_yuv420A_R(y, u, v, kSome, 1, 1, 1, header, bits);
-}
-
-TEST(ChecksDeathTest, RgbToYuv) {
-    struct Row {
-        ToYuv convert;
+TEST(ChecksDeathTest, BitmapsAndPlanes) {
+    struct {
+        Convert convert;
+        const char* bitmap;
         int bits;
         unsigned line;
+    } const rows[] = {
+        {RUN(Rgb32_2_yuv420(y, u, v, 1, 1, 1, header, bits)), "lpSrc", 32, 652},
+        {RUN(Argb_2_yuv420(y, u, v, 1, 1, 1, header, bits)), "lpSrc", 32, 887},
+        {RUN(Rgb24_2_yuv420(y, u, v, 1, 1, 1, header, bits)), "lpSrc", 24, 996},
+        {RUN(Rgb32_2_yuv420A(y, u, v, kSome, 1, 1, 1, header, bits, 1)), "lpSrc", 32, 1683},
+        {RUN(Rgb32_2_yuv420A_R(y, u, v, kSome, 1, 1, 1, header, bits)), "lpSrc", 32, 1683},
+        {RUN(Yuv420_2_rgb24(header, bits, y, u, v, 1, 1, 1)), "lpDst", 24, 283},
+        {RUN(Yuv420_2_rgb32(header, bits, y, u, v, 1, 1, 1)), "lpDst", 32, 414},
+        {RUN(Yuv420_2_Argb(header, bits, y, u, v, 1, 1, 1)), "lpDst", 32, 529},
     };
-    const Row rows[] = {{Rgb32_2_yuv420, 32, 652},
-                        {Argb_2_yuv420, 32, 887},
-                        {Rgb24_2_yuv420, 24, 996},
-                        {Rgb32ToYuvWithAlpha, 32, 1683},
-                        {Rgb32ToYuvWithAlphaR, 32, 1683}};
-    const std::string buffers = "lpSrcBits && pY && pU && pV";
-    for (const Row& row : rows) {
+    for (const auto& row : rows) {
+        const std::string bitmap = row.bitmap;
+        const std::string format =
+            bitmap + "Bmi && " + bitmap + "Bmi->biBitCount == " + std::to_string(row.bits);
         auto* const right = row.bits == 32 ? &header32 : &header24;
         auto* const wrong = row.bits == 32 ? &header24 : &header32;
-        const std::string format = "lpSrcBmi && lpSrcBmi->biBitCount == " + std::to_string(row.bits);
-        const auto call = [&](unsigned char* y, unsigned char* u, unsigned char* v,
-                              tagBITMAPINFOHEADER* header, unsigned char* bits) {
-            return [=] { row.convert(y, u, v, 1, 1, 1, header, bits); };
-        };
-        ExpectFailedCheck(call(kSome, kSome, kSome, nullptr, kSome), row.line, format);
-        ExpectFailedCheck(call(nullptr, nullptr, nullptr, wrong, nullptr), row.line, format);
-        ExpectFailedCheck(call(nullptr, kSome, kSome, right, kSome), row.line + 1, buffers);
-        ExpectFailedCheck(call(kSome, nullptr, kSome, right, kSome), row.line + 1, buffers);
-        ExpectFailedCheck(call(kSome, kSome, nullptr, right, kSome), row.line + 1, buffers);
-        ExpectFailedCheck(call(kSome, kSome, kSome, right, nullptr), row.line + 1, buffers);
+        ExpectFailedCheck([&] { row.convert(nullptr, kSome, kSome, kSome, kSome); }, row.line, format);
+        ExpectFailedCheck([&] { row.convert(wrong, nullptr, nullptr, nullptr, nullptr); }, row.line, format);
+        for (const int missing : {0, 1, 2, 3}) {
+            const auto at = [missing](int i) { return i == missing ? nullptr : kSome; };
+            ExpectFailedCheck([&] { row.convert(right, at(0), at(1), at(2), at(3)); }, row.line + 1,
+                              bitmap + "Bits && pY && pU && pV");
+        }
     }
     for (const int missing : {0, 1, 2, 3}) {
         const auto at = [missing](int i) { return i == missing ? nullptr : kSome; };
         ExpectFailedCheck([&] { Rgb32_2_yuv420_Ex(at(0), at(1), at(2), 1, 1, 1, at(3), 0, 0, 0); }, 761,
-                          buffers);
-    }
-}
-
-TEST(ChecksDeathTest, YuvToRgb) {
-    struct Row {
-        ToRgb convert;
-        int bits;
-        unsigned line;
-    };
-    const Row rows[] = {{Yuv420_2_rgb24, 24, 283}, {Yuv420_2_rgb32, 32, 414}, {Yuv420_2_Argb, 32, 529}};
-    for (const Row& row : rows) {
-        auto* const right = row.bits == 32 ? &header32 : &header24;
-        auto* const wrong = row.bits == 32 ? &header24 : &header32;
-        const std::string format = "lpDstBmi && lpDstBmi->biBitCount == " + std::to_string(row.bits);
-        ExpectFailedCheck([&] { row.convert(nullptr, kSome, kSome, kSome, kSome, 1, 1, 1); }, row.line,
-                          format);
-        ExpectFailedCheck([&] { row.convert(wrong, nullptr, kSome, kSome, kSome, 1, 1, 1); }, row.line,
-                          format);
-        for (const int missing : {0, 1, 2, 3}) {
-            const auto at = [missing](int i) { return i == missing ? nullptr : kSome; };
-            ExpectFailedCheck([&] { row.convert(right, at(0), at(1), at(2), at(3), 1, 1, 1); }, row.line + 1,
-                              "lpDstBits && pY && pU && pV");
-        }
+                          "lpSrcBits && pY && pU && pV");
     }
 }
 

@@ -9,17 +9,8 @@
 #include <gtest/gtest.h>
 
 inline std::string LevelName(const testing::TestParamInfo<image::KernelLevel>& info) {
-    switch (info.param) {
-    case image::KernelLevel::kPlain:
-        return "Plain";
-    case image::KernelLevel::kSse41:
-        return "Sse41";
-    case image::KernelLevel::kAvx2:
-        return "Avx2";
-    case image::KernelLevel::kAvx512:
-        return "Avx512";
-    }
-    return "Unknown";
+    constexpr const char* kNames[] = {"Plain", "Sse41", "Avx2", "Avx512"};
+    return kNames[static_cast<int>(info.param)];
 }
 
 #ifdef MOVIECONV_EMULATED_AVX512

@@ -1,5 +1,4 @@
 // The exported RGB-to-YUV routines against the equations applied pixel by pixel.
-#include "tests/image/Equations.h"
 #include "tests/image/TestPicture.h"
 
 #include <algorithm>
@@ -12,10 +11,6 @@ using equations::Rgb;
 using equations::Yuv;
 
 using PixelAt = std::function<Rgb(int row, int column)>;
-
-Rgb PixelOf(const TestRows& rows, int row, int byte) {
-    return {rows.At(row, byte + 2), rows.At(row, byte + 1), rows.At(row, byte)};
-}
 
 void ExpectPlanes(TestPlanes& planes, PictureSize size, const PixelAt& pixelAt) {
     for (int blockRow = 0; blockRow < (size.height + 1) / 2; ++blockRow) {
@@ -55,44 +50,26 @@ struct Routine {
     void (*run)(TestPlanes& to, TestRows& alpha, Source from);
 };
 
-#define TO_PLANES to.y.Data(), to.u.Data(), to.v.Data()
-#define PITCHES to.y.Pitch(), to.u.Pitch(), to.v.Pitch()
+// The table reads best with each call spelled out in the same few words.
+#define RUN(call) [](TestPlanes& to, [[maybe_unused]] TestRows& alpha, Source from) { call; }
+#define PICTURE &from.header, from.rows.Data()
 
 const Routine kRoutines[] = {
-    {"Rgb32_2_yuv420", 4, true, false, false,
-     [](TestPlanes& to, TestRows&, Source from) {
-         Rgb32_2_yuv420(TO_PLANES, PITCHES, &from.header, from.rows.Data());
-     }},
-    {"Argb_2_yuv420", 4, false, false, false,
-     [](TestPlanes& to, TestRows&, Source from) {
-         Argb_2_yuv420(TO_PLANES, PITCHES, &from.header, from.rows.Data());
-     }},
+    {"Rgb32_2_yuv420", 4, true, false, false, RUN(Rgb32_2_yuv420(PLANES(to), PITCHES(to), PICTURE))},
+    {"Argb_2_yuv420", 4, false, false, false, RUN(Argb_2_yuv420(PLANES(to), PITCHES(to), PICTURE))},
     {"Rgb32_2_yuv420_Ex", 4, false, true, false,
-     [](TestPlanes& to, TestRows&, Source from) {
-         Rgb32_2_yuv420_Ex(TO_PLANES, PITCHES, from.rows.Data(), from.size.width, from.size.height,
-                           from.rows.Pitch());
-     }},
+     RUN(Rgb32_2_yuv420_Ex(PLANES(to), PITCHES(to), from.rows.Data(), from.size.width, from.size.height,
+                           from.rows.Pitch()))},
     {"Rgb32_2_yuv420_Ex, negative height", 4, true, true, false,
-     [](TestPlanes& to, TestRows&, Source from) {
-         Rgb32_2_yuv420_Ex(TO_PLANES, PITCHES, from.rows.Data(), from.size.width, -from.size.height,
-                           from.rows.Pitch());
-     }},
-    {"Rgb24_2_yuv420", 3, true, false, false,
-     [](TestPlanes& to, TestRows&, Source from) {
-         Rgb24_2_yuv420(TO_PLANES, PITCHES, &from.header, from.rows.Data());
-     }},
+     RUN(Rgb32_2_yuv420_Ex(PLANES(to), PITCHES(to), from.rows.Data(), from.size.width, -from.size.height,
+                           from.rows.Pitch()))},
+    {"Rgb24_2_yuv420", 3, true, false, false, RUN(Rgb24_2_yuv420(PLANES(to), PITCHES(to), PICTURE))},
     {"Rgb32_2_yuv420A", 4, false, false, true,
-     [](TestPlanes& to, TestRows& alpha, Source from) {
-         Rgb32_2_yuv420A(TO_PLANES, alpha.Data(), PITCHES, &from.header, from.rows.Data(), 0);
-     }},
+     RUN(Rgb32_2_yuv420A(PLANES(to), alpha.Data(), PITCHES(to), PICTURE, 0))},
     {"Rgb32_2_yuv420A, bottom-up", 4, true, false, true,
-     [](TestPlanes& to, TestRows& alpha, Source from) {
-         Rgb32_2_yuv420A(TO_PLANES, alpha.Data(), PITCHES, &from.header, from.rows.Data(), -7);
-     }},
+     RUN(Rgb32_2_yuv420A(PLANES(to), alpha.Data(), PITCHES(to), PICTURE, -7))},
     {"Rgb32_2_yuv420A_R", 4, true, false, true,
-     [](TestPlanes& to, TestRows& alpha, Source from) {
-         Rgb32_2_yuv420A_R(TO_PLANES, alpha.Data(), PITCHES, &from.header, from.rows.Data());
-     }},
+     RUN(Rgb32_2_yuv420A_R(PLANES(to), alpha.Data(), PITCHES(to), PICTURE))},
 };
 
 void CheckRoutine(const Routine& routine, PictureSize size, int padding) {
@@ -107,7 +84,7 @@ void CheckRoutine(const Routine& routine, PictureSize size, int padding) {
 
     const auto memoryRow = [&](int row) { return routine.bottomUp ? size.height - 1 - row : row; };
     ExpectPlanes(planes, size, [&](int row, int column) {
-        return PixelOf(source, memoryRow(row), routine.pixelBytes * column);
+        return source.PixelAt(memoryRow(row), routine.pixelBytes * column);
     });
     if (routine.alpha) {
         for (int row = 0; row < size.height; ++row)
@@ -161,7 +138,7 @@ TEST(Rgb24_2_yuv420Simple, ConvertsWholeBlocksOnly) {
                 int v = 0;
                 for (const int r : {row, row + 1}) {
                     for (const int c : {column, column + 1}) {
-                        const Yuv yuv = equations::SimpleYuv(PixelOf(source, size.height - 1 - r, 3 * c));
+                        const Yuv yuv = equations::SimpleYuv(source.PixelAt(size.height - 1 - r, 3 * c));
                         to.y.Expect(r, c, yuv.y);
                         u += yuv.u;
                         v += yuv.v;
@@ -172,7 +149,7 @@ TEST(Rgb24_2_yuv420Simple, ConvertsWholeBlocksOnly) {
             }
         }
         auto header = BitmapHeader(size.width, size.height, 32);
-        Rgb24_2_yuv420Simple(TO_PLANES, PITCHES, &header, source.Data());
+        Rgb24_2_yuv420Simple(PLANES(to), PITCHES(to), &header, source.Data());
         to.Check();
         ASSERT_FALSE(testing::Test::HasFatalFailure()) << size.width << " x " << size.height;
     }

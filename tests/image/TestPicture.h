@@ -4,6 +4,7 @@
 #define MOVIECONV_TESTS_IMAGE_TESTPICTURE_H
 
 #include "Common/Image/ImageConvert.h"
+#include "tests/image/Equations.h"
 #include "tests/image/GuardedMemory.h"
 
 #include <cstdint>
@@ -32,6 +33,16 @@ public:
     uint8_t At(int row, int byte) const { return bytes[Offset(row, byte)]; }
     void Expect(int row, int byte, int value) {
         expected.at(Offset(row, byte)) = static_cast<uint8_t>(value);
+    }
+
+    /// The pixel of three or four bytes that begins at `byte`.
+    equations::Rgb PixelAt(int row, int byte) const {
+        return {At(row, byte + 2), At(row, byte + 1), At(row, byte)};
+    }
+    void ExpectPixel(int row, int byte, equations::Rgb pixel) {
+        Expect(row, byte, pixel.b);
+        Expect(row, byte + 1, pixel.g);
+        Expect(row, byte + 2, pixel.r);
     }
 
     void Check(const std::string& what) const {
@@ -70,6 +81,10 @@ struct TestPlanes {
 
     TestRows y, u, v;
 };
+
+// Planes as the routines take them.
+#define PLANES(picture) (picture).y.Data(), (picture).u.Data(), (picture).v.Data()
+#define PITCHES(picture) (picture).y.Pitch(), (picture).u.Pitch(), (picture).v.Pitch()
 
 inline tagBITMAPINFOHEADER BitmapHeader(int width, int height, int bits) {
     tagBITMAPINFOHEADER header{};

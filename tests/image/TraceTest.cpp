@@ -10,6 +10,8 @@
 
 namespace {
 
+constexpr PictureSize kNothing[] = {{0, 4}, {4, 0}, {-1, 4}, {4, std::numeric_limits<int>::min()}};
+
 VideoImage MakeImage(TestPlanes& planes, int width, int height) {
     VideoImage image{};
     image.nType = kMediaTypePicture;
@@ -43,8 +45,7 @@ TEST(TraceImage, LooksAtPlanesOfPlanarPicturesOnly) {
     image.nType = 3;
     xTraceImage(&image);
     image.nType = kMediaTypePicture;
-    for (const PictureSize size :
-         {PictureSize{0, 4}, {4, 0}, {-1, 4}, {4, std::numeric_limits<int>::min()}}) {
+    for (const PictureSize size : kNothing) {
         image.nWidth = size.width;
         image.nHeight = size.height;
         xTraceImage(&image);
@@ -78,8 +79,7 @@ TEST(TraceBitmap, ReadsThePlanesAtOrBehindTheHeader) {
 
 TEST(TraceBitmap, DoesNothingForASizeOfZeroOrLess) {
     tagBITMAPINFO info{};
-    for (const PictureSize size :
-         {PictureSize{0, 4}, {4, 0}, {-1, 4}, {4, std::numeric_limits<int>::min()}}) {
+    for (const PictureSize size : kNothing) {
         info.bmiHeader = BitmapHeader(size.width, size.height, 12);
         xTraceImage(&info, nullptr);
     }

@@ -1,5 +1,4 @@
 // The exported planar-YUV-to-RGB routines against the equations applied pixel by pixel.
-#include "tests/image/Equations.h"
 #include "tests/image/TestPicture.h"
 
 #include <limits>
@@ -41,16 +40,13 @@ void CheckRoutine(const Routine& routine, PictureSize size, int padding) {
             const Rgb rgb = routine.equations(
                 {from.y.At(row, column), from.u.At(row / 2, column / 2), from.v.At(row / 2, column / 2)});
             const int byte = routine.pixelBytes * column;
-            to.Expect(memoryRow, byte, rgb.b);
-            to.Expect(memoryRow, byte + 1, rgb.g);
-            to.Expect(memoryRow, byte + 2, rgb.r);
+            to.ExpectPixel(memoryRow, byte, rgb);
             if (routine.opaque)
                 to.Expect(memoryRow, byte + 3, 255);
         }
     }
     auto header = BitmapHeader(size.width, size.height, 8 * routine.pixelBytes);
-    routine.convert(&header, to.Data(), from.y.Data(), from.u.Data(), from.v.Data(), from.y.Pitch(),
-                    from.u.Pitch(), from.v.Pitch());
+    routine.convert(&header, to.Data(), PLANES(from), PITCHES(from));
     to.Check(routine.name);
 }
 
@@ -72,7 +68,7 @@ TEST_P(YuvToRgbTest, ConvertsNothingOfSizeZeroOrLess) {
     constexpr int kLeast = std::numeric_limits<int>::min();
     for (const PictureSize size : {PictureSize{0, 4}, {4, 0}, {-4, 4}, {4, -4}, {kLeast, 4}, {4, kLeast}}) {
         auto header = BitmapHeader(size.width, size.height, 8 * GetParam().pixelBytes);
-        GetParam().convert(&header, to.Data(), from.y.Data(), from.u.Data(), from.v.Data(), 4, 2, 2);
+        GetParam().convert(&header, to.Data(), PLANES(from), PITCHES(from));
     }
     to.Check("bitmap");
 }
