@@ -54,7 +54,7 @@ int ConvThread::AudioLoop::Run() {
 
 unsigned ConvThread::AudioLoop::Iterate() {
     for (;; nFrame = WrapAdd(nFrame, 1)) {
-        if (StopRequested())
+        if (converter.IsStopRequestedAfterPause())
             return kOutcomeStopped;
         const AudioFrame* block = converter.pAudioDecoder->GetNextFrame();
         if (!block || block->nLength == 0 || LengthReached())

@@ -87,7 +87,7 @@ int ConvThread::AudioVideoLoop::Run() {
 
 unsigned ConvThread::AudioVideoLoop::Iterate() {
     for (;; nFrame = WrapAdd(nFrame, 1)) {
-        if (StopRequested())
+        if (converter.IsStopRequestedAfterPause())
             return kOutcomeStopped;
         if (LengthReached() || (bAudioDone && bVideoDone))
             return kOutcomeCompleted;

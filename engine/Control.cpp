@@ -115,7 +115,7 @@ int ConvThread::Pause() {
     const int count = ++nPauseCount;
     SettleState();
     // A stop asked for meanwhile may have released the pauses already; the worker must not sleep through it.
-    if (hStopEvent && hStopEvent->Wait(0) == kWaitSignalled) {
+    if (IsStopRequested()) {
         ReleasePauses();
         return 0;
     }

@@ -8,8 +8,6 @@
 #include <algorithm>
 #include <cmath>
 
-#include <unistd.h>
-
 namespace {
 
 constexpr int32_t kProgressComplete = 10000; // hundredths of a percent
@@ -55,12 +53,6 @@ double ConvThread::Conversion::BeginTime() {
 
 void ConvThread::Conversion::StartClock() {
     tStart = tLastEstimate = MillisecondClock();
-}
-
-bool ConvThread::Conversion::StopRequested() const {
-    while (converter.nState == kStatePaused)
-        usleep(10000);
-    return !converter.hStopEvent || converter.hStopEvent->Wait(0) == kWaitSignalled;
 }
 
 bool ConvThread::Conversion::LengthReached() const {

@@ -32,9 +32,6 @@ protected:
     /// Starts measuring.
     void StartClock();
 
-    /// Sits out a pause; true when a stop was asked for.
-    bool StopRequested() const;
-
     /// True when the requested length, if there is one, has been converted.
     bool LengthReached() const;
 

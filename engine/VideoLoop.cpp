@@ -71,7 +71,7 @@ int ConvThread::VideoLoop::ReportNoPictures() {
 
 unsigned ConvThread::VideoLoop::Iterate() {
     for (;;) {
-        if (StopRequested())
+        if (converter.IsStopRequestedAfterPause())
             return kOutcomeStopped;
         VideoImage* picture = converter.pVideoDecoder->GetCurrentImage();
         if (!picture || LengthReached())

@@ -100,12 +100,9 @@ void* BaseThread::thread_func(void* arg) {
 }
 
 int BaseThread::svc() {
-    for (;;) {
-        while (nState == kStatePaused)
-            usleep(10000);
-        if (IsStopRequested())
-            return 0;
+    while (!IsStopRequestedAfterPause()) {
     }
+    return 0;
 }
 
 int BaseThread::Abort() {
@@ -138,6 +135,12 @@ void BaseThread::Join() {
 
 bool BaseThread::IsStopRequested() const {
     return !hStopEvent || hStopEvent->Wait(0) == kWaitSignalled;
+}
+
+bool BaseThread::IsStopRequestedAfterPause() const {
+    while (nState == kStatePaused)
+        usleep(10000);
+    return IsStopRequested();
 }
 
 void BaseThread::ReleasePauses() {

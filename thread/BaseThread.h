@@ -44,6 +44,9 @@ protected:
     /// True once the worker shall end.
     bool IsStopRequested() const;
 
+    /// For the worker: sits out a pause, then tells as IsStopRequested whether to end.
+    bool IsStopRequestedAfterPause() const;
+
     /// Brings the state of an active worker in line with the pause count and the stop request, after any
     /// change of them.
     void SettleState();
@@ -62,8 +65,8 @@ private:
     bool StartThread();
     void Join();
 
-    pthread_mutex_t joinMutex =
-        PTHREAD_MUTEX_INITIALIZER; // held while the thread is made and while it is joined
+    // Held while the thread is made and while it is joined.
+    pthread_mutex_t joinMutex = PTHREAD_MUTEX_INITIALIZER;
 };
 
 #pragma GCC visibility push(default)

@@ -69,11 +69,8 @@ public:
 private:
     int svc() override {
         ++runs;
-        while (!atOnce && !IsStopRequested()) {
+        while (!atOnce && !IsStopRequestedAfterPause())
             usleep(100);
-            while (nState == kStatePaused)
-                usleep(100);
-        }
         return 0;
     }
 
