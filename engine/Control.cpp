@@ -77,10 +77,10 @@ int ConvThread::svc() {
         if (pfnProgress)
             pfnProgress(pProgressContext, 1, kOutcomeFailed, 0);
     } else if (encodeParam.bNoVideo || IsEmpty(pVideoDecoder)) {
-        DropVideo();
+        Drop(pVideoDecoder, encodeParam.bNoVideo);
         process_audio_only();
     } else if (encodeParam.bNoAudio || IsEmpty(pAudioDecoder)) {
-        DropAudio();
+        Drop(pAudioDecoder, encodeParam.bNoAudio);
         process_video_only();
     } else {
         process();
@@ -89,20 +89,13 @@ int ConvThread::svc() {
     return 0;
 }
 
-void ConvThread::DropVideo() {
-    const bool empty = IsEmpty(pVideoDecoder);
+template <class Decoder>
+void ConvThread::Drop(Decoder*& decoder, int32_t& bNoStream) {
+    const bool empty = IsEmpty(decoder);
     const CSingleLock guard(&sharedLock);
     if (empty)
-        pVideoDecoder = nullptr;
-    encodeParam.bNoVideo = 1;
-}
-
-void ConvThread::DropAudio() {
-    const bool empty = IsEmpty(pAudioDecoder);
-    const CSingleLock guard(&sharedLock);
-    if (empty)
-        pAudioDecoder = nullptr;
-    encodeParam.bNoAudio = 1;
+        decoder = nullptr;
+    bNoStream = 1;
 }
 
 unsigned ConvThread::EnablePreview(unsigned enable) {

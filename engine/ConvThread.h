@@ -63,9 +63,9 @@ private:
     int process_audio_only();
     int process_video_only();
 
-    /// Switches one stream off, for this and every later run; an empty decoder is forgotten.
-    void DropVideo();
-    void DropAudio();
+    /// Switches the decoder's stream off, for this and every later run; an empty decoder is forgotten.
+    template <class Decoder>
+    void Drop(Decoder*& decoder, int32_t& bNoStream);
 
     /// Makes and records the name of the next clip. Null, with a log line, when no such name can be made.
     wchar_t* CreateNewClip();
