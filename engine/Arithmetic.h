@@ -33,8 +33,8 @@ T Truncate(double value) {
         return 0;
     if (value <= static_cast<double>(Limits::min()))
         return Limits::min();
-    if (value >=
-        static_cast<double>(Limits::max())) // for 64 bits the limit rounds up to 2^63, itself out of range
+    // For 64 bits this limit rounds up to 2^63, which is out of range itself.
+    if (value >= static_cast<double>(Limits::max()))
         return Limits::max();
     return static_cast<T>(value);
 }

@@ -35,7 +35,7 @@ private:
     void WriteSound(const VideoImage* picture);
     void WriteBlock(const AudioFrame& block, int64_t pictureTime);
     bool WriteSilence(const VideoImage* picture);
-    void WriteSilence(int32_t gap);
+    void WriteSilentBlocks(int32_t gap);
     void WritePicture(const VideoImage& picture);
     void Estimate(uint32_t now);
     bool LastPictureReached() const { return int64_t{nFrame} >= int64_t{nTotalFrames} - 1; }
@@ -173,11 +173,11 @@ bool ConvThread::AudioVideoLoop::WriteSilence(const VideoImage* picture) {
     const auto gap =
         static_cast<int32_t>(static_cast<uint32_t>(picture->llTime) - static_cast<uint32_t>(llAudioSrc));
     if (gap > 0)
-        WriteSilence(gap);
+        WriteSilentBlocks(gap);
     return true;
 }
 
-void ConvThread::AudioVideoLoop::WriteSilence(int32_t gap) {
+void ConvThread::AudioVideoLoop::WriteSilentBlocks(int32_t gap) {
     const EncodeParam& param = converter.encodeParam;
     AudioFrame block{};
     block.nType = kMediaTypeSilence;

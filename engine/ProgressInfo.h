@@ -32,8 +32,8 @@ typedef struct ProgressInfo {
     /// dPosition again. In the final record the length of the conversion, or the requested length when only
     /// sound was converted.
     double dDoneLength;
-    double
-        dSpeed; ///< Seconds of source converted per second, as last estimated; 0 while there is no estimate.
+    /// Seconds of source converted per second, as last estimated; 0 while there is no estimate.
+    double dSpeed;
 } ProgressInfo;
 
 #pragma pack(pop)

@@ -44,10 +44,8 @@ typedef struct FileFormatInfo {
     uint32_t fccFormat;     ///< The format's code; 0 ends the table. Read by the engine.
     char szName[128];       ///< Human-readable name, UTF-8, zero-terminated.
     char szExtensions[128]; ///< File-name extensions without dots, separated by commas, the usual one first.
-    uint32_t
-        fccVideoCodecs[32]; ///< Video codecs that the format carries, the default first; 0 ends the list.
-    uint32_t
-        fccAudioCodecs[32]; ///< Audio codecs that the format carries, the default first; 0 ends the list.
+    uint32_t fccVideoCodecs[32]; ///< Video codecs that the format carries, the default first; 0 ends them.
+    uint32_t fccAudioCodecs[32]; ///< Audio codecs that the format carries, the default first; 0 ends them.
     unsigned char reserved[296]; ///< Zero.
     int32_t bHasAudio;           ///< 0: the format cannot carry sound. Read by the engine.
     int32_t bHasVideo;           ///< 0: the format cannot carry pictures. Read by the engine.
