@@ -4,7 +4,9 @@
 
 #include <algorithm>
 #include <cmath>
+#include <new>
 #include <system_error>
+#include <vector>
 
 extern "C" {
 #include <libavutil/display.h>
@@ -78,6 +80,13 @@ AVRational PixelAspect(AVFormatContext* context, AVStream* stream, bool turned) 
         return {1, 1};
     }
     return turned ? av_inv_q(aspect) : aspect;
+}
+
+void CopyParameters(const AVCodecParameters& from, AVCodecParameters* to) {
+    if (to == nullptr) {
+        throw std::bad_alloc();
+    }
+    av::CheckMemory(avcodec_parameters_copy(to, &from));
 }
 
 std::string LayoutName(const AVChannelLayout& layout) {
@@ -236,6 +245,7 @@ void Source::FindDuration() {
 }
 
 /// Where the last packet ends, found by reading the end of the file. 0 when the file cannot be read that way.
+/// That may describe the streams anew, as they are there; for the decoders they are as at the beginning.
 double Source::LastStampSeconds() {
     if (input_->pb == nullptr || (input_->pb->seekable & AVIO_SEEKABLE_NORMAL) == 0) {
         return 0;
@@ -246,6 +256,11 @@ double Source::LastStampSeconds() {
     const int sought =
         byBytes ? avformat_seek_file(input_.get(), -1, INT64_MIN, target, INT64_MAX, AVSEEK_FLAG_BYTE)
                 : avformat_seek_file(input_.get(), -1, INT64_MIN, INT64_MAX / 2, INT64_MAX, 0);
+    std::vector<av::CodecParameters> beginnings;
+    for (unsigned i = 0; i < input_->nb_streams; ++i) {
+        beginnings.emplace_back(avcodec_parameters_alloc());
+        CopyParameters(*input_->streams[i]->codecpar, beginnings[i].get());
+    }
     double last = 0;
     const av::Packet packet = av::NewPacket();
     while (sought >= 0 && av_read_frame(input_.get(), packet.get()) >= 0) {
@@ -255,6 +270,9 @@ double Source::LastStampSeconds() {
             last = std::max(last, ToSeconds(MediaTime(stamp + packet->duration, stream)));
         }
         av_packet_unref(packet.get());
+    }
+    for (std::size_t i = 0; i < beginnings.size(); ++i) {
+        CopyParameters(*beginnings[i], input_->streams[i]->codecpar);
     }
     const int64_t start = input_->start_time != AV_NOPTS_VALUE ? input_->start_time : 0;
     if (avformat_seek_file(input_.get(), -1, INT64_MIN, start, start, 0) < 0 &&

@@ -170,6 +170,21 @@ const SoundCase kSoundCases[] = {
 INSTANTIATE_TEST_SUITE_P(Forms, DecodersSound, testing::ValuesIn(kSoundCases),
                          [](const auto& test) { return test.param.name; });
 
+TEST(Decoders, KeepTheFormOfSoundThatChangesOnTheWay) {
+    const Folder folder;
+    std::string bytes;
+    for (const char* channels : {"1", "2"}) {
+        bytes += ReadFile(Make(std::string("form-") + channels + ".mp2",
+                               Join(Beeps(2), Args{"-c:a", "mp2", "-ac", channels})));
+    }
+    WriteFile(folder / "changing.mp2", bytes);
+    Movie movie(folder / "changing.mp2", {});
+    EXPECT_EQ(movie.Sound()->GetAudioInfo()->format.nChannels, 1);
+    const Seen seen = TakeAll(movie);
+    EXPECT_NEAR(static_cast<double>(seen.sound.size()) / 44100, 4, 0.1);
+    EXPECT_EQ(Beginnings(seen, 44100).size(), 4u);
+}
+
 TEST(Decoders, FillTheTimeBeforeLateSound) {
     const std::string path = Make("late.mkv", Join(CountedPictures(4), Args{"-itsoffset", "1.3"}, Beeps(2),
                                                    Args{"-c:v", "mpeg4", "-q:v", "2", "-c:a", "pcm_s16le"}));
