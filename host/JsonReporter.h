@@ -20,7 +20,6 @@ public:
     void Warning(const std::string& text) override;
     void Error(const std::string& text) override;
     void End(const EndReport& report) override;
-    double Interval() const override { return 0.5; }
 
 private:
     void Print(std::string_view event, const std::string& fields) const;

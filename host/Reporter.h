@@ -73,9 +73,6 @@ public:
 
     /// Leaves the terminal line before something else writes to the terminal.
     virtual void LeaveLine() {}
-
-    /// How often figures are worth asking for, in seconds; negative when never.
-    virtual double Interval() const { return -1; }
 };
 
 /// The reporter that the options ask for. `streams` must outlive it.

@@ -36,7 +36,6 @@ public:
     void Start(const StartReport& report) override;
     void Progress(const ProgressReport& report, bool milestone) override;
     void FileClosed(const FileReport& report) override;
-    double Interval() const override { return 5; }
 
 private:
     double nextAt_ = 0; // seconds of work
@@ -52,7 +51,6 @@ public:
     void Error(const std::string& text) override;
     void End(const EndReport& report) override;
     void LeaveLine() override;
-    double Interval() const override { return 0.2; }
 
 private:
     void EraseLine();

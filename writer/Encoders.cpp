@@ -113,7 +113,8 @@ bool TakesLayout(const AVCodec& codec, const AVChannelLayout& layout) {
     return false;
 }
 
-/// The usual layout of the largest number of channels, at most `asked`, that the codec takes.
+/// The usual layout of the largest number of channels, at most `asked`, that the codec takes; every one in
+/// the table takes one channel.
 void ChooseLayout(const AVCodec& codec, int asked, AVChannelLayout& layout) {
     for (int channels = asked; channels > 0; --channels) {
         const av::ChannelLayout candidate(channels);
@@ -122,7 +123,6 @@ void ChooseLayout(const AVCodec& codec, int asked, AVChannelLayout& layout) {
             return;
         }
     }
-    av_channel_layout_default(&layout, 2);
 }
 
 AVSampleFormat ChooseSampleFormat(const AVCodec& codec, int bitsPerSample) {

@@ -46,11 +46,11 @@ void AddStreams(const AVFormatContext& input, const Muxer& written, Muxer& joine
 
 struct Box {
     std::array<char, 4> type;
-    int64_t size; ///< With its header; 0 when the header is not whole or makes no sense.
+    int64_t size; ///< With its header, below 2^32; 0 when the header is not whole or makes no sense.
 };
 
 Box ReadBox(ByteFile& file, int64_t position) {
-    std::array<uint8_t, 16> header{};
+    std::array<uint8_t, 8> header{};
     size_t count = 0;
     if (file.Seek(position, SEEK_SET) < 0)
         return {};
@@ -60,15 +60,13 @@ Box ReadBox(ByteFile& file, int64_t position) {
             break;
         count += static_cast<size_t>(got);
     }
-    const auto number = [&](size_t from, size_t length) {
-        return std::accumulate(&header[from], &header[from] + length, int64_t{0},
-                               [](int64_t value, uint8_t byte) { return value << 8 | byte; });
-    };
-    Box box{{}, count < 8 ? 0 : number(0, 4)};
+    if (count < header.size())
+        return {};
+    Box box{{}, std::accumulate(&header[0], &header[4], int64_t{0}, [](int64_t value, uint8_t byte) {
+                return value << 8 | byte;
+            })};
     std::memcpy(box.type.data(), &header[4], box.type.size());
-    if (box.size == 1)
-        box.size = count < 16 ? 0 : number(8, 8);
-    return box.size < 8 ? Box{} : box;
+    return box.size < static_cast<int64_t>(header.size()) ? Box{} : box;
 }
 
 /// How far `part` consists of whole fragments.

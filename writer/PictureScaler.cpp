@@ -63,8 +63,6 @@ void RepeatEdges(AVFrame& frame, int padWidth, int padHeight) {
 
 PictureFit FitPicture(int width, int height, AVRational sampleAspect, int outWidth, int outHeight,
                       bool stretch) {
-    if (sampleAspect.num <= 0 || sampleAspect.den <= 0)
-        sampleAspect = {1, 1};
     PictureFit fit;
     fit.width = fit.fittedWidth = outWidth;
     fit.height = fit.fittedHeight = outHeight;
