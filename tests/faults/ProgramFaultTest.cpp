@@ -90,8 +90,11 @@ TEST(OutputFault, ALimitOfTheFileSizeIsTold) {
     ASSERT_EQ(getrlimit(RLIMIT_FSIZE, &usual), 0);
     const rlimit small{500'000, usual.rlim_max}; // for the program, which inherits it
     ASSERT_EQ(setrlimit(RLIMIT_FSIZE, &small), 0);
-    const Result result = Call({source, folder / "out.mp4"});
+    const Result result = Call({source, folder / "out.mp4", "--progress", "json"});
     setrlimit(RLIMIT_FSIZE, &usual);
+    EXPECT_NE(result.out.find("\"event\":\"error\",\"text\":\"cannot write"), std::string::npos)
+        << result.out;
+    EXPECT_NE(result.out.find("\"outcome\":\"failed\",\"exit_code\":4"), std::string::npos) << result.out;
     EXPECT_EQ(result.code, 4) << result.err;
     EXPECT_NE(result.err.find("File too large; what was"), std::string::npos) << result.err;
     EXPECT_GT(PicturesIn(folder / "out.mp4.part"), 25u);

@@ -90,6 +90,8 @@ TEST(ProgressText, FitsTheTerminalAndNeverRoundsUp) {
     }
     report.percent.reset();
     EXPECT_EQ(ProgressText(report, 1000).find('%'), std::string::npos);
+    report.phase = Phase::kWaitingForRoom;
+    EXPECT_NE(ProgressText(report, 1000).find("disk full, waiting"), std::string::npos);
 }
 
 TEST(JsonString, EscapesWhatJsonDoesNotTake) {

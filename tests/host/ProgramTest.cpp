@@ -151,7 +151,7 @@ const Odd kOddities[] = {
      "o.ts",
      25,
      2,
-     {"--size", "80x80", "--frame-rate", "12.5", "--video-codec", "h264"}},
+     {"--size", "80x80", "--frame-rate", "12.5", "--video-codec", "avc1", "--video-max-rate", "1M"}},
 };
 INSTANTIATE_TEST_SUITE_P(Sources, ProgramTakes, testing::ValuesIn(kOddities));
 
@@ -177,6 +177,7 @@ TEST(Program, RefusesAndLeavesEverythingAsItWas) {
     fs::create_hard_link(source, folder / "same.mkv");
     WriteFile(folder / "there.mp4", "precious");
     WriteFile(folder / "clip_03.mp4", "precious");
+    WriteFile(folder / "text.srt", "1\n00:00:00,000 --> 00:00:01,000\nWords alone.\n");
     const std::string whole = ReadFile(
         Make("index-first.mp4", Join(CountedPictures(1), Beeps(1), Args{"-movflags", "+faststart"})));
     WriteFile(folder / "head.mp4", whole.substr(0, whole.find("mdat") + 4)); // opens, but holds nothing
@@ -192,6 +193,10 @@ TEST(Program, RefusesAndLeavesEverythingAsItWas) {
         {{source, folder / "there.mp4"}, 4, "--overwrite"},
         {{source, folder / "clip.mp4", "--split", "1"}, 4, "clip_03.mp4"},
         {{source, folder / "clip", "--split", "1", "-f", "mp4"}, 2, "extension"},
+        {{source, folder / (std::string(249, 'n') + ".mp4"), "--split", "1"}, 2, "too long"},
+        {{source, folder / "out.mp3", "--split", "1"}, 2, "needs pictures"},
+        {{source, folder / "there.mp4/out.mp4"}, 4, "is not a folder"},
+        {{"--estimate", source, folder / "nowhere/out.mp4"}, 4, "nowhere"},
         {{source, folder / "nowhere/out.mp4"}, 4, "nowhere"},
         {{source, "/proc/out.mp4"}, 4, "/proc"}, // where not even the superuser can create a file
         {{source, folder.Path(), "-f", "mp4"}, 4, "is a folder"},
@@ -201,11 +206,13 @@ TEST(Program, RefusesAndLeavesEverythingAsItWas) {
         {{source, folder / "out"}, 2, "--format"},
         {{folder / "none.mkv", folder / "out.mp4"}, 3, "none.mkv"},
         {{folder / "there.mp4", folder / "out.mp4"}, 3, "there.mp4"},
+        {{folder / "text.srt", folder / "out.mp4"}, 3, "no pictures and no sound"},
         {{folder / "head.mp4", folder / "there.mp4", "-y"}, 3, "nothing to convert"},
         {{source, folder / "out.mp4", "--begin", "9"}, 2, "--begin"},
         {{source, folder / "out.mp4", "--begin", "soon"}, 2, "soon"},
         {{source, folder / "out.mp4", "--fit", "wide"}, 2, "\"wide\" is not borders|stretch"},
         {{source, folder / "out.webm", "--video-codec", "XVID"}, 2, "XVID"},
+        {{source, folder / "out.mp4", "--video-codec", "H.264"}, 2, "four characters"},
         {{source, folder / "out.mp4", "--no-video", "--no-audio"}, 2, "--no-audio"},
         {{source, folder / "out.mp3", "--no-audio"}, 2, "MP3"},
         {{source}, 2, "OUTPUT"},
@@ -253,6 +260,12 @@ TEST(Program, KeepsAPreview) {
     ASSERT_EQ(seen.pictures.size(), 1u);
     EXPECT_EQ(seen.pictures[0].width, 160);
     EXPECT_NEAR(seen.pictures[0].luma, LumaOf(99), 4);
+
+    const Result without =
+        Call({Counted(), folder / "out.mkv", "--preview", folder / "nowhere/now.png", "--progress", "none"});
+    EXPECT_EQ(without.code, 0);
+    EXPECT_NE(without.err.find("nowhere/now.png\": No such file"), std::string::npos) << without.err;
+    EXPECT_EQ(without.out.find("100% done"), 0u) << without.out;
 }
 
 TEST(Program, TellsAboutSourcesFormatsAndRoom) {
@@ -260,9 +273,10 @@ TEST(Program, TellsAboutSourcesFormatsAndRoom) {
     const Result info = Call({"--info", Counted()});
     EXPECT_EQ(info.code, 0);
     EXPECT_NE(info.out.find("160 x 120"), std::string::npos) << info.out;
-    const Result estimate = Call({"--estimate", Counted(), folder / "out.mp4"});
+    const Result estimate = Call({"--estimate", Counted(), "out.mp4"});
     EXPECT_EQ(estimate.code, 0) << estimate.err;
     EXPECT_NE(estimate.out.find("320.0 kB"), std::string::npos) << estimate.out; // 640 kbit/s for 4 s
+    EXPECT_NE(estimate.out.find("are free in \".\""), std::string::npos) << estimate.out;
     EXPECT_NE(Call({"--list-formats"}).out.find("MKV"), std::string::npos);
     EXPECT_NE(Call({"--help"}).out.find("--split"), std::string::npos);
     EXPECT_NE(Call({"--version"}).out.find("movieconv 1."), std::string::npos);
@@ -359,7 +373,10 @@ TEST(Program, LeavesTheTerminalWhileItIsSuspended) {
     EXPECT_LT(minutes * 60 + seconds, most.count());
 }
 
-TEST(Program, StopsWhileItsSourceStalls) {
+class ProgramStalls : public testing::TestWithParam<const char*> {};
+
+TEST_P(ProgramStalls, AndStops) {
+    const bool beforeTheBegin = GetParam() != std::string("0");
     const Folder folder;
     const std::string pipe = folder / "pipe";
     ASSERT_EQ(mkfifo(pipe.c_str(), 0600), 0);
@@ -369,14 +386,17 @@ TEST(Program, StopsWhileItsSourceStalls) {
     ASSERT_GE(fcntl(end, F_SETPIPE_SZ, 1 << 20), static_cast<int>(movie.size()));
     const std::size_t half = movie.size() / 2;
     ASSERT_EQ(write(end, movie.data(), half), static_cast<ssize_t>(half));
-    Running running({pipe, folder / "out.mp4", "--progress", "json"}, false);
-    EXPECT_TRUE(running.WaitFor("\"position_s\":[3-9]"));
+    Running running({pipe, folder / "out.mp4", "--progress", "json", "--begin", GetParam()}, false);
+    EXPECT_TRUE(running.WaitFor(beforeTheBegin ? "clip_opened" : "\"position_s\":[3-9]"));
     running.Signal(SIGINT);
     const Result result = running.Finish();
     close(end);
     EXPECT_EQ(result.code, 6) << result.out;
-    EXPECT_GT(LookAt(folder / "out.mp4").pictures.size(), 70u);
+    EXPECT_EQ(folder.Names(), beforeTheBegin ? Args{"pipe"} : (Args{"out.mp4", "pipe"}));
+    EXPECT_TRUE(beforeTheBegin || LookAt(folder / "out.mp4").pictures.size() > 70);
 }
+
+INSTANTIATE_TEST_SUITE_P(Begins, ProgramStalls, testing::Values("0", "6"));
 
 TEST(Program, WritesTheSameFileWhateverThePauses) {
     const Folder folder;

@@ -108,7 +108,7 @@ TEST(Sound, BlocksThatSplitASampleAreJoined) {
         TestSound sound(44100, 2, 16);
         AudioFrame piece = sound.Next(10'000, 0);
         for (int position = 0; position < 40'000; position += piece.nLength, piece.pData += piece.nLength) {
-            piece.nLength = std::min(1001, 40'000 - position);
+            piece.nLength = position < 9 ? 1 : std::min(1001, 40'000 - position);
             MWWriteAudioData(file, &piece);
         }
     });
@@ -141,6 +141,7 @@ TEST(Sound, BitRatesAreKeptWithinTheCodecsLimits) {
     movie.sampleRate = 8000;
     movie.channels = 1;
     for (const auto& [format, codec] : {std::pair{FourCC("M4A "), FourCC("AAC ")},
+                                        {FourCC("M4A "), FourCC("mp4a")}, // another name of AAC
                                         {FourCC("MP3 "), FourCC("MP3 ")},
                                         {FourCC("OGG "), FourCC("VORB")},
                                         {FourCC("OGG "), FourCC("OPUS")}}) {

@@ -291,6 +291,16 @@ TEST(StampNormaliser, PicturesAloneBeginAtZeroWhereverTheirStampsBegin) {
     }
 }
 
+TEST(StampNormaliser, StampsThatCannotBeCountAsNone) {
+    for (const int64_t stamp : {INT64_MIN, INT64_MAX, 7 * 3600 * kSecond}) {
+        StampNormaliser stamps(400'000, true);
+        stamps.AddSound(kSecond, 176'400, 176'400, false);
+        EXPECT_EQ(stamps.AddPicture(stamp), 0);
+        EXPECT_EQ(stamps.AddPicture(INT64_MAX), 400'000);
+        EXPECT_EQ(stamps.Repairs(), 2);
+    }
+}
+
 TEST(StampNormaliser, SoundAloneBeginsAtZero) {
     EXPECT_EQ(StampNormaliser(400'000, false).SoundStart(), 0);
     StampNormaliser waiting(400'000, true);
