@@ -57,9 +57,9 @@ public:
         std::optional<Item> item(std::move(items_.front().first));
         weight_ -= items_.front().second;
         items_.pop_front();
-        const bool half_empty = items_.size() <= maxItems_ / 2 && weight_ <= maxWeight_ / 2;
+        const bool halfEmpty = items_.size() <= maxItems_ / 2 && weight_ <= maxWeight_ / 2;
         lock.unlock();
-        if (half_empty) {
+        if (halfEmpty) {
             room_.notify_all();
         }
         return item;

@@ -72,19 +72,19 @@ void SetPreset(AVCodecContext& context, AVRational rate) {
     const auto set = [&](const char* name, const char* value) {
         av::CheckMemory(av_opt_set(context.priv_data, name, value, 0));
     };
-    const int key_distance = std::max(1, static_cast<int>(std::lround(av_q2d(rate) * kKeyFrameSeconds)));
+    const int keyDistance = std::max(1, static_cast<int>(std::lround(av_q2d(rate) * kKeyFrameSeconds)));
     const char* encoder = context.codec->name;
     if (std::strcmp(encoder, "libx264") == 0) {
         set("preset", "fast");
-        context.gop_size = key_distance;
+        context.gop_size = keyDistance;
     } else if (std::strcmp(encoder, "libx265") == 0) {
         set("preset", "fast");
         set("x265-params", "log-level=none");
-        context.gop_size = key_distance;
+        context.gop_size = keyDistance;
     } else if (std::strncmp(encoder, "libvpx", 6) == 0) {
         set("deadline", "good");
         set("cpu-used", "4");
-        context.gop_size = key_distance;
+        context.gop_size = keyDistance;
     }
 }
 
@@ -192,13 +192,13 @@ void VideoEncoder::Finish(const PacketTaker& take) {
 
 void VideoEncoder::Send(AVFrame* frame, const PacketTaker& take) {
     Pump(*context_, frame, *packet_, [&](AVPacket& packet) {
-        const int64_t decoding_index = packet.dts;
+        const int64_t decodingIndex = packet.dts;
         packet.pts = TickOf(packet.pts);
-        packet.dts = TickOf(decoding_index);
+        packet.dts = TickOf(decodingIndex);
         packet.duration = ticksPerPicture_;
         take(packet);
         // Nothing that comes later is decoded or shown before this.
-        for (; firstIndex_ < decoding_index; ++firstIndex_)
+        for (; firstIndex_ < decodingIndex; ++firstIndex_)
             ticks_.pop_front();
     });
 }

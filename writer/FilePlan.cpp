@@ -110,11 +110,11 @@ VideoPlan MakeVideoPlan(const EncodeParam& param, const VideoFormat& source, con
     plan.settings.fullRange = plan.picture.fullRange;
     plan.settings.inOrder = container.kind == ContainerKind::kSteadyRate;
     plan.clock = MakePictureClock(plan.settings.rate, container.kind == ContainerKind::kSteadyRate);
-    const double source_rate = UsableRate(source.dFrameRate);
+    const double sourceRate = UsableRate(source.dFrameRate);
     const double rate = av_q2d(plan.settings.rate);
-    plan.keepStamps = source_rate > 0.0 && SameRate(rate, source_rate);
+    plan.keepStamps = sourceRate > 0.0 && SameRate(rate, sourceRate);
     plan.pictureLength =
-        std::llround(static_cast<double>(kUnitsPerSecond) / (source_rate > 0.0 ? source_rate : rate));
+        std::llround(static_cast<double>(kUnitsPerSecond) / (sourceRate > 0.0 ? sourceRate : rate));
     return plan;
 }
 

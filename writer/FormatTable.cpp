@@ -125,8 +125,8 @@ bool CanEncode(const Table& table, uint32_t code) {
 /// The codes from `fitting` that can be encoded here, into the zeroed list `codes`; true when there is one.
 template <typename Table>
 bool CopyEncodable(const Table& table, const std::array<uint32_t, 10>& fitting, uint32_t* codes) {
-    const auto can_encode = [&](uint32_t code) { return code != 0 && CanEncode(table, code); };
-    return std::copy_if(fitting.begin(), fitting.end(), codes, can_encode) != codes;
+    const auto canEncode = [&](uint32_t code) { return code != 0 && CanEncode(table, code); };
+    return std::copy_if(fitting.begin(), fitting.end(), codes, canEncode) != codes;
 }
 
 FileFormatInfo Describe(const Container& container) {

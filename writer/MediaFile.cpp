@@ -106,8 +106,8 @@ void MediaFile::OpenStages() {
                                     int64_t{encoder.has_b_frames} * clock.ticksPerPicture);
     }
     if (plan_.audio) {
-        const bool fills_start = plan_.container->kind == ContainerKind::kSteadyRate;
-        sound_ = std::make_unique<SoundStage>(*plan_.audio, flags, fills_start, NeedsSound(plan_));
+        const bool fillsStart = plan_.container->kind == ContainerKind::kSteadyRate;
+        sound_ = std::make_unique<SoundStage>(*plan_.audio, flags, fillsStart, NeedsSound(plan_));
         const AVCodecContext& encoder = sound_->Encoder();
         soundStream_ =
             AddEncoder(*muxer_, encoder, {1, encoder.sample_rate}, {0, 1}, encoder.initial_padding);
@@ -183,9 +183,9 @@ bool MediaFile::AddSound(const AudioFrame& frame, const PcmFormat& format) {
     std::vector<uint8_t>& data = waiting_.back().data;
     data.insert(data.end(), frame.pData, frame.pData + frame.nLength);
     StartSoundIfKnown();
-    const bool long_enough = waiting_.size() > 1 || static_cast<int64_t>(data.size()) >=
-                                                        format.BytesPerSecond() / kStretchesPerSecond;
-    return !soundStarted_ || !long_enough || PushSound();
+    const bool longEnough = waiting_.size() > 1 || static_cast<int64_t>(data.size()) >=
+                                                       format.BytesPerSecond() / kStretchesPerSecond;
+    return !soundStarted_ || !longEnough || PushSound();
 }
 
 void MediaFile::StartSoundIfKnown() {

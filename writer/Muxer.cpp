@@ -155,8 +155,8 @@ Muxer::Written Muxer::Stream(int stream) const {
     const State& state = streams_[static_cast<size_t>(stream)];
     const AVStream* out = output_->streams[stream];
     const int64_t length = state.endPts - state.firstPts - out->codecpar->initial_padding;
-    const int64_t run_up = av_rescale_q(state.runUp, state.unit, out->time_base);
-    return {{out->codecpar, out->time_base, out->avg_frame_rate, out->sample_aspect_ratio, run_up},
+    const int64_t runUp = av_rescale_q(state.runUp, state.unit, out->time_base);
+    return {{out->codecpar, out->time_base, out->avg_frame_rate, out->sample_aspect_ratio, runUp},
             state.delay,
             state.packets,
             static_cast<double>(std::max<int64_t>(0, length)) * av_q2d(state.unit)};

@@ -147,10 +147,10 @@ std::string FolderOf(const std::string& path) {
 std::unique_ptr<ByteFile> CreateBeside(FileSystem& files, const std::string& target,
                                        const std::string& suffix, std::string& path, int& error) {
     constexpr int kMostNumbers = 1000;
-    const size_t name_at = target.rfind('/') == std::string::npos ? 0 : target.rfind('/') + 1;
+    const size_t nameAt = target.rfind('/') == std::string::npos ? 0 : target.rfind('/') + 1;
     for (int number = 1; number <= kMostNumbers; ++number) {
         const std::string tail = number == 1 ? suffix : suffix + std::to_string(number);
-        path = target.substr(0, name_at) + CutName(target.substr(name_at), NAME_MAX - tail.size()) + tail;
+        path = target.substr(0, nameAt) + CutName(target.substr(nameAt), NAME_MAX - tail.size()) + tail;
         std::unique_ptr<ByteFile> file = files.Create(path, error);
         if (file || error != EEXIST)
             return file;

@@ -87,9 +87,9 @@ int64_t PicturePacer::GridIndex(int64_t time) const {
 
 int64_t PicturePacer::TickOf(int64_t time) {
     const int64_t steps = GridIndex(time - *origin_);
-    const int64_t on_grid = *origin_ + av_rescale_q(steps, av_inv_q(clock_.rate), kUnit);
+    const int64_t onGrid = *origin_ + av_rescale_q(steps, av_inv_q(clock_.rate), kUnit);
     const int64_t tolerance = std::min(kGridTolerance, av_rescale_q(1, av_inv_q(clock_.rate), kUnit) / 8);
-    const int64_t value = std::abs(time - on_grid) <= tolerance
+    const int64_t value = std::abs(time - onGrid) <= tolerance
                               ? av_rescale_q(*origin_, kUnit, clock_.tick) + steps * clock_.ticksPerPicture
                               : av_rescale_q(time, kUnit, clock_.tick);
     return lastTick_ ? std::max(value, *lastTick_ + 1) : value;

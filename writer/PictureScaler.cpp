@@ -67,9 +67,9 @@ PictureFit FitPicture(int width, int height, AVRational sampleAspect, int outWid
     fit.width = fit.fittedWidth = outWidth;
     fit.height = fit.fittedHeight = outHeight;
     // Sizes are whole pixels: proportions that differ by less than one pixel are the same.
-    const double same_height = static_cast<double>(height) * outWidth / width;
-    const double same_width = static_cast<double>(width) * outHeight / height;
-    if (std::abs(same_height - outHeight) < 1 || std::abs(same_width - outWidth) < 1) {
+    const double sameHeight = static_cast<double>(height) * outWidth / width;
+    const double sameWidth = static_cast<double>(width) * outHeight / height;
+    if (std::abs(sameHeight - outHeight) < 1 || std::abs(sameWidth - outWidth) < 1) {
         fit.sampleAspect = sampleAspect;
         return fit;
     }
@@ -120,8 +120,8 @@ PictureScaler::PictureScaler(const Output& output, AVRational sampleAspect, bool
 
 av::Frame PictureScaler::Convert(av::Frame picture) {
     const bool padded = output_.padWidth > 0 || output_.padHeight > 0;
-    const bool same_format = picture->format == output_.format && sourceFullRange_ == output_.fullRange;
-    if (same_format && !padded && picture->width == output_.width && picture->height == output_.height)
+    const bool sameFormat = picture->format == output_.format && sourceFullRange_ == output_.fullRange;
+    if (sameFormat && !padded && picture->width == output_.width && picture->height == output_.height)
         return picture;
     PrepareFor(*picture);
     av::Frame frame =

@@ -19,14 +19,14 @@ size_t ByteSize(const VideoImage& image) {
 
 av::Frame CopyPicture(FramePool& pool, const VideoImage& image) {
     av::Frame frame = pool.Get(AV_PIX_FMT_YUV420P, image.nWidth, image.nHeight);
-    const int chroma_width = (image.nWidth + 1) / 2;
-    const int chroma_height = (image.nHeight + 1) / 2;
+    const int chromaWidth = (image.nWidth + 1) / 2;
+    const int chromaHeight = (image.nHeight + 1) / 2;
     av_image_copy_plane(frame->data[0], frame->linesize[0], image.pY, image.nPitchY, image.nWidth,
                         image.nHeight);
-    av_image_copy_plane(frame->data[1], frame->linesize[1], image.pU, image.nPitchU, chroma_width,
-                        chroma_height);
-    av_image_copy_plane(frame->data[2], frame->linesize[2], image.pV, image.nPitchV, chroma_width,
-                        chroma_height);
+    av_image_copy_plane(frame->data[1], frame->linesize[1], image.pU, image.nPitchU, chromaWidth,
+                        chromaHeight);
+    av_image_copy_plane(frame->data[2], frame->linesize[2], image.pV, image.nPitchV, chromaWidth,
+                        chromaHeight);
     return frame;
 }
 

@@ -35,13 +35,13 @@ int UsedChannels(const PcmFormat& format) {
 /// Takes the first `channels` channels; 24-bit samples go into the upper bytes of 32-bit ones.
 void Repack(const PcmFormat& format, int channels, const uint8_t* data, int frames,
             std::vector<uint8_t>& out) {
-    const size_t from_size = format.bits / 8;
-    const size_t to_size = format.bits == 24 ? 4 : from_size;
-    out.assign(static_cast<size_t>(frames) * channels * to_size, 0);
-    uint8_t* to = out.data() + (to_size - from_size);
+    const size_t fromSize = format.bits / 8;
+    const size_t toSize = format.bits == 24 ? 4 : fromSize;
+    out.assign(static_cast<size_t>(frames) * channels * toSize, 0);
+    uint8_t* to = out.data() + (toSize - fromSize);
     for (int frame = 0; frame < frames; ++frame, data += format.BytesPerFrame()) {
-        for (int channel = 0; channel < channels; ++channel, to += to_size)
-            std::copy_n(data + channel * from_size, from_size, to);
+        for (int channel = 0; channel < channels; ++channel, to += toSize)
+            std::copy_n(data + channel * fromSize, fromSize, to);
     }
 }
 
@@ -74,23 +74,23 @@ size_t SoundConverter::PieceSize(const PcmFormat& format) const {
 void SoundConverter::Push(const PcmFormat& format, const uint8_t* data, size_t size) {
     if (!(format == source_))
         Prepare(format);
-    const auto frame_size = static_cast<size_t>(format.BytesPerFrame());
+    const auto frameSize = static_cast<size_t>(format.BytesPerFrame());
     if (!rest_.empty()) {
-        const size_t missing = std::min(frame_size - rest_.size(), size);
+        const size_t missing = std::min(frameSize - rest_.size(), size);
         rest_.insert(rest_.end(), data, data + missing);
         data += missing;
         size -= missing;
-        if (rest_.size() < frame_size)
+        if (rest_.size() < frameSize)
             return;
         const std::vector<uint8_t> whole = std::exchange(rest_, {});
         Convert(whole.data(), 1);
     }
-    const size_t frames = size / frame_size;
+    const size_t frames = size / frameSize;
     for (size_t done = 0; done < frames; done += kFramesAtOnce) {
         const size_t count = std::min<size_t>(kFramesAtOnce, frames - done);
-        Convert(data + done * frame_size, static_cast<int>(count));
+        Convert(data + done * frameSize, static_cast<int>(count));
     }
-    rest_.assign(data + frames * frame_size, data + size);
+    rest_.assign(data + frames * frameSize, data + size);
 }
 
 void SoundConverter::PushSilence(int64_t samples) {

@@ -79,10 +79,10 @@ void SoundStage::Run(int64_t start) {
 
 /// In pieces: a block of a low rate is far longer in the encoder's samples.
 void SoundStage::Encode(const SoundBlock& block, const PacketTaker& take) {
-    const size_t piece_size = converter_.PieceSize(block.format);
-    for (size_t done = 0; done < block.data.size() && !cancelled_; done += piece_size) {
+    const size_t pieceSize = converter_.PieceSize(block.format);
+    for (size_t done = 0; done < block.data.size() && !cancelled_; done += pieceSize) {
         converter_.Push(block.format, block.data.data() + done,
-                        std::min(piece_size, block.data.size() - done));
+                        std::min(pieceSize, block.data.size() - done));
         EncodeAvailable(encoder_.FrameSize(), take);
     }
 }

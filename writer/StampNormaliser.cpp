@@ -90,17 +90,17 @@ int64_t StampNormaliser::PlaceNext(int64_t stamp, const Picture& before) {
             soundStart_ = std::max<int64_t>(0, continued - SoundLength());
         return continued;
     }
-    const int64_t from_start = reference_->position + Step(reference_->stamp, stamp);
+    const int64_t fromStart = reference_->position + Step(reference_->stamp, stamp);
     if (!soundStart_) {
         // The first picture after sound in this file; those before carried another timeline, so its own step
         // is unknown.
         const int64_t time = before.time + pictureLength_;
-        const int64_t gap = time - from_start;
+        const int64_t gap = time - fromStart;
         soundStart_ = gap > kLongestGap ? 0 : std::max<int64_t>(0, gap);
         ++repairs_;
         return time;
     }
-    const int64_t ideal = *soundStart_ + from_start;
+    const int64_t ideal = *soundStart_ + fromStart;
     if (ideal > *soundStart_ + SoundLength() + kFarthestAhead) {
         repairs_ += continued == ideal ? 0 : 1;
         return continued;

@@ -285,7 +285,7 @@ size_t CountEntries(const char* folder) {
 TEST_F(Fault, NeitherFilesNorThreadsAreLeftBehind) {
     movie_.pictures = 10;
     movie_.soundSeconds = 0.4;
-    const auto run_all = [&] {
+    const auto runAll = [&] {
         for (const int failing : {-1, 0, 1}) {
             Faults faults;
             faults.failingWrite = failing;
@@ -293,11 +293,11 @@ TEST_F(Fault, NeitherFilesNorThreadsAreLeftBehind) {
         }
         MWCloseMediaFile(movie_.Create(folder_ / "no/such/folder/movie"), nullptr, nullptr);
     };
-    run_all();
+    runAll();
     const size_t descriptors = CountEntries("/proc/self/fd");
     const size_t threads = CountEntries("/proc/self/task");
     for (int round = 0; round < 5; ++round)
-        run_all();
+        runAll();
     EXPECT_EQ(CountEntries("/proc/self/fd"), descriptors);
     EXPECT_EQ(CountEntries("/proc/self/task"), threads);
 }

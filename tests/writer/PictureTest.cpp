@@ -27,9 +27,9 @@ TestMovie WithoutSound() {
 }
 
 TEST(Pictures, EveryOneIsWrittenOnceWithoutItsPadding) {
-    for (const int pitch_extra : {0, 1, 13, 64}) {
+    for (const int pitchExtra : {0, 1, 13, 64}) {
         TestMovie movie;
-        movie.pitchExtra = pitch_extra;
+        movie.pitchExtra = pitchExtra;
         const ReadMovie read = WriteAndRead(movie);
         ASSERT_EQ(read.pictures.size(), 50U);
         for (int number = 0; number < 50; ++number)

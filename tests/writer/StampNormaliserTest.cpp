@@ -157,9 +157,9 @@ void CheckClip(const Clip& clip, const Source& source, const std::string& what) 
     }
     if (!placed.pictureAfterReal)
         return;
-    const int64_t real_time = placed.soundStart + *placed.realPosition;
+    const int64_t realTime = placed.soundStart + *placed.realPosition;
     for (size_t i = 0; i < placed.times.size(); ++i) {
-        const int64_t distance = placed.times[i] - real_time;
+        const int64_t distance = placed.times[i] - realTime;
         const int64_t truth = placed.sources[i] - *placed.realSource;
         ASSERT_LT(std::abs(distance - truth), picture) << "picture " << i;
     }
@@ -259,7 +259,7 @@ TEST(StampNormaliser, DoesNotDriftInAnHour) {
 
 TEST(StampNormaliser, CatchesUpAfterAHoleInTheSoundWithoutEverGoingBack) {
     StampNormaliser stamps(400'000, true);
-    const int64_t bytes_per_second = 44100 * 4;
+    const int64_t bytesPerSecond = 44100 * 4;
     int64_t last = -1;
     // 40 ms of sound before every picture; after a second the source's sound skips two seconds, so that the
     // pictures step back by as much until they have reached the sound again.
@@ -267,7 +267,7 @@ TEST(StampNormaliser, CatchesUpAfterAHoleInTheSoundWithoutEverGoingBack) {
         const bool waiting = picture >= 25 && picture < 75;
         const int64_t position = (picture < 25 ? picture : picture < 75 ? 25 : picture - 50) * 400'000;
         if (!waiting)
-            stamps.AddSound(position, bytes_per_second / 25, bytes_per_second, false);
+            stamps.AddSound(position, bytesPerSecond / 25, bytesPerSecond, false);
         const int64_t time = stamps.AddPicture(waiting ? position - (75 - picture) * 400'000 : position);
         ASSERT_GT(time, last) << picture;
         ASSERT_LE(time - last, 400'001) << picture;

@@ -34,32 +34,32 @@ TEST(MediaWriter, RefusesRecordsThatMakeNoSense) {
     void* file = TestMovie().Create(folder / "movie");
     ASSERT_NE(file, nullptr);
     TestPicture picture(160, 120);
-    const VideoImage good_image = picture.Paint(0, 0);
-    const std::vector<std::function<void(VideoImage&)>> image_faults{
+    const VideoImage goodImage = picture.Paint(0, 0);
+    const std::vector<std::function<void(VideoImage&)>> imageFaults{
         [](VideoImage& image) { image.nFormat = 1; },       [](VideoImage& image) { image.pU = nullptr; },
         [](VideoImage& image) { image.nWidth = 0; },        [](VideoImage& image) { image.nHeight = -120; },
         [](VideoImage& image) { image.nPitchY = 159; },     [](VideoImage& image) { image.nPitchV = 79; },
         [](VideoImage& image) { image.nWidth = INT32_MAX; }};
-    for (const auto& spoil : image_faults) {
-        VideoImage image = good_image;
+    for (const auto& spoil : imageFaults) {
+        VideoImage image = goodImage;
         spoil(image);
         EXPECT_EQ(MWWriteVideoFrame(file, &image), 0);
     }
     TestSound sound(44100, 2, 16);
-    const AudioFrame good_frame = sound.Next(100, 0);
-    const std::vector<std::function<void(AudioFrame&)>> frame_faults{[](AudioFrame& frame) { frame.nSampleRate = 0; },
-                                                                     [](AudioFrame& frame) { frame.nChannels = 0; },
-                                                                     [](AudioFrame& frame) { frame.nBitsPerSample = 12; },
-                                                                     [](AudioFrame& frame) { frame.pData = nullptr; },
-                                                                     [](AudioFrame& frame) { frame.nLength = 0; },
-                                                                     [](AudioFrame& frame) { frame.nLength = -4; }};
-    for (const auto& spoil : frame_faults) {
-        AudioFrame frame = good_frame;
+    const AudioFrame goodFrame = sound.Next(100, 0);
+    const std::vector<std::function<void(AudioFrame&)>> frameFaults{[](AudioFrame& frame) { frame.nSampleRate = 0; },
+                                                                    [](AudioFrame& frame) { frame.nChannels = 0; },
+                                                                    [](AudioFrame& frame) { frame.nBitsPerSample = 12; },
+                                                                    [](AudioFrame& frame) { frame.pData = nullptr; },
+                                                                    [](AudioFrame& frame) { frame.nLength = 0; },
+                                                                    [](AudioFrame& frame) { frame.nLength = -4; }};
+    for (const auto& spoil : frameFaults) {
+        AudioFrame frame = goodFrame;
         spoil(frame);
         EXPECT_EQ(MWWriteAudioData(file, &frame), 0);
     }
-    EXPECT_EQ(MWWriteVideoFrame(file, &good_image), 1);
-    EXPECT_EQ(MWWriteAudioData(file, &good_frame), 1);
+    EXPECT_EQ(MWWriteVideoFrame(file, &goodImage), 1);
+    EXPECT_EQ(MWWriteAudioData(file, &goodFrame), 1);
     EXPECT_EQ(MWCloseMediaFile(file, nullptr, nullptr), 1);
     EXPECT_EQ(Latest().llPicturesReceived, 1);
     EXPECT_EQ(Latest().llSamplesReceived, 100);

@@ -14,21 +14,21 @@ constexpr double kFrequency = 440.0;
 } // namespace
 
 TestPicture::TestPicture(int width, int height, int pitchExtra) {
-    const int chroma_width = (width + 1) / 2;
-    const int chroma_height = (height + 1) / 2;
+    const int chromaWidth = (width + 1) / 2;
+    const int chromaHeight = (height + 1) / 2;
     image_.nType = kMediaTypePicture;
     image_.nFormat = kPictureFormatPlanar420;
     image_.nWidth = width;
     image_.nHeight = height;
     image_.nPitchY = width + pitchExtra;
-    image_.nPitchU = chroma_width + pitchExtra;
-    image_.nPitchV = chroma_width + 2 * pitchExtra;
+    image_.nPitchU = chromaWidth + pitchExtra;
+    image_.nPitchV = chromaWidth + 2 * pitchExtra;
     planes_[0].assign(static_cast<size_t>(image_.nPitchY) * height, 255);
-    planes_[1].assign(static_cast<size_t>(image_.nPitchU) * chroma_height, 255);
-    planes_[2].assign(static_cast<size_t>(image_.nPitchV) * chroma_height, 255);
-    for (int row = 0; row < chroma_height; ++row) {
-        std::memset(&planes_[1][static_cast<size_t>(row) * image_.nPitchU], 120, chroma_width);
-        std::memset(&planes_[2][static_cast<size_t>(row) * image_.nPitchV], 136, chroma_width);
+    planes_[1].assign(static_cast<size_t>(image_.nPitchU) * chromaHeight, 255);
+    planes_[2].assign(static_cast<size_t>(image_.nPitchV) * chromaHeight, 255);
+    for (int row = 0; row < chromaHeight; ++row) {
+        std::memset(&planes_[1][static_cast<size_t>(row) * image_.nPitchU], 120, chromaWidth);
+        std::memset(&planes_[2][static_cast<size_t>(row) * image_.nPitchV], 136, chromaWidth);
     }
     image_.pY = planes_[0].data();
     image_.pU = planes_[1].data();
@@ -101,7 +101,7 @@ void TestMovie::WriteAll(void* file, const std::function<void(int)>& before) con
     TestSound sound(sampleRate, channels, bits, quietSeconds);
     const int64_t samples = std::llround(soundSeconds * sampleRate);
     int64_t written = 0;
-    const auto write_sound = [&](int64_t until) {
+    const auto writeSound = [&](int64_t until) {
         while (hasAudio && written < samples && written * kSecond / sampleRate <= until) {
             const int count = static_cast<int>(std::min<int64_t>(512, samples - written));
             MWWriteAudioData(file, &sound.Next(count, written * kSecond / sampleRate));
@@ -110,12 +110,12 @@ void TestMovie::WriteAll(void* file, const std::function<void(int)>& before) con
     };
     for (int number = 0; hasVideo && number < pictures; ++number) {
         const auto time = static_cast<int64_t>(std::llround(number * kSecond / rate));
-        write_sound(time);
+        writeSound(time);
         if (before)
             before(number);
         MWWriteVideoFrame(file, &picture.Paint(number, time));
     }
-    write_sound(INT64_MAX);
+    writeSound(INT64_MAX);
 }
 
 bool TestMovie::Write(const std::string& path) const {
