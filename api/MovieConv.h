@@ -67,10 +67,10 @@ void MCDestroy(MCHandle converter);
 
 // ---- Before a conversion
 
-/// Sets the encoding parameters. Picture size, frame rate, sample rate, channels, bits per sample and bit
-/// rates that are 0 are completed from the source, and a stream that the file format cannot carry is switched
-/// off. A frame rate above 200 becomes 30 when there is a video decoder. Null completes the parameters that
-/// are set. Always 1.
+/// Sets the encoding parameters. For the streams that the source has, a picture size, frame rate, sample
+/// rate, channel count or sample size of 0 becomes the source's, and a bit rate of 0 becomes 512 kbit/s for
+/// pictures, 64 kbit/s for sound. A stream that the file format cannot carry is switched off. A frame rate
+/// above 200 becomes 30 when there is a video decoder. Null completes the parameters that are set. Always 1.
 int MCSetEncodeParam(MCHandle converter, const EncodeParam* param);
 
 /// Copies the parameters in force to `out`, if it is not null. A stream that the last conversion did not find
@@ -113,8 +113,8 @@ long long MCGetDiskFreeSpace(const wchar_t* path);
 ///
 /// The news comes in two ways: `callback`, unless it is null, is called on the worker thread with `context`,
 /// and events of class 5000 and kind 'kind' go to the main event queue, with `window` (which may be null) as
-/// 32-bit parameter 'HWND', 0 or 100 as 'WPAM' and the progress or the outcome as 'LPAM'. Progress events
-/// come only with a callback.
+/// 32-bit parameter 'HWND', 0 or 100 as 'WPAM' and the progress or the outcome as 'LPAM'. Without a callback
+/// there is one progress event, that of a completed conversion.
 ///
 /// 0 when started, and without effect when the converter runs already; MC_CANNOT_OPEN_SOURCE. Everything that
 /// goes wrong later is told by the outcome.

@@ -12,8 +12,8 @@
 
 #pragma pack(push, 4)
 
-/// What to encode: 104 bytes, no padding. Fields that are 0 and have a counterpart in the source are
-/// completed from it by MCSetEncodeParam.
+/// What to encode: 104 bytes, no padding. MCSetEncodeParam completes fields that are 0, from the source or by
+/// defaults.
 typedef struct EncodeParam {
     uint32_t fccVideo;        ///< Video codec, "XVID" by default.
     uint32_t fccColorFormat;  ///< Picture format handed to the media writer, "YV12" by default.

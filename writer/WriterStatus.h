@@ -84,14 +84,14 @@ typedef struct WriterStatus {
 enum {
     kWriterEventOpened = 1,  ///< A file was created and takes pictures and sound.
     kWriterEventRefused = 2, ///< A file could not be created: MWCreateMediaFile is about to return null.
-    kWriterEventFailed = 3,  ///< Writing failed; nothing more is taken. Comes once, long before the close.
+    kWriterEventFailed = 3,  ///< Writing failed; nothing more is taken. Comes once, at once.
     /// The close goes on; comes at its start and whenever dFinished has grown visibly.
     kWriterEventFinishing = 4,
     kWriterEventClosed = 5 ///< The file is complete, or the failed or empty one is closed.
 };
 
-/// Told of what happens to files. Called on the engine's worker for all but kWriterEventFailed, which comes
-/// on a thread of the writer's. It must return soon and must not call back into the converter except for
+/// Told of what happens to files. Called on the engine's worker for all but kWriterEventFailed, which may
+/// come on a thread of the writer's. It must return soon and must not call back into the converter except for
 /// MCAbort.
 typedef void (*WriterListener)(void* context, int event, const WriterStatus* status);
 
