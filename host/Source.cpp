@@ -9,6 +9,7 @@
 #include <vector>
 
 extern "C" {
+#include <libavutil/avstring.h>
 #include <libavutil/display.h>
 #include <libavutil/pixdesc.h>
 }
@@ -48,8 +49,9 @@ AVRational FrameRate(const AVStream* stream) {
     return IsPlausible(nominal) ? nominal : kFallbackFrameRate;
 }
 
-double StreamDuration(const AVStream* stream) {
-    return stream->duration > 0 ? static_cast<double>(stream->duration) * av_q2d(stream->time_base) : 0;
+/// Matroska and NUT announce where the movie ends on its clock, all others how long it is.
+bool AnnouncesItsEnd(const AVInputFormat& format) {
+    return av_match_name("matroska", format.name) != 0 || av_match_name("nut", format.name) != 0;
 }
 
 /// Reads the turn that brings the stored picture upright from the container's display matrix.
@@ -190,7 +192,7 @@ void Source::DescribePictures(int index) {
     info.height = turned ? parameters->width : parameters->height;
     info.pixelAspect = PixelAspect(input_.get(), stream, turned);
     info.frameRate = av_q2d(FrameRate(stream));
-    info.duration = StreamDuration(stream);
+    info.duration = EndOf(stream);
     info.interlaced = parameters->field_order > AV_FIELD_PROGRESSIVE;
     info.colorPrimaries = parameters->color_primaries;
     info.colorTransfer = parameters->color_trc;
@@ -211,13 +213,26 @@ void Source::DescribeSound(int index) {
     const int storedBits =
         std::max(parameters->bits_per_raw_sample, av_get_exact_bits_per_sample(parameters->codec_id));
     info.bitsPerSample = storedBits > 16 ? 32 : 16;
-    info.duration = StreamDuration(stream);
+    info.duration = EndOf(stream);
     info_.sound = info;
+}
+
+/// When a stream ends, from the start of the source; 0 when it does not tell. It may begin later than others.
+double Source::EndOf(const AVStream* stream) const {
+    if (stream->duration <= 0) {
+        return 0;
+    }
+    const bool tellsBegin = stream->start_time != AV_NOPTS_VALUE;
+    const double begin = tellsBegin ? ToSeconds(MediaTime(stream->start_time, stream)) : 0;
+    return begin + static_cast<double>(stream->duration) * av_q2d(stream->time_base);
 }
 
 void Source::FindDuration() {
     const bool guessedByRate = input_->duration_estimation_method == AVFMT_DURATION_FROM_BITRATE;
     double whole = input_->duration > 0 ? static_cast<double>(input_->duration) / AV_TIME_BASE : 0;
+    if (whole > 0 && AnnouncesItsEnd(*input_->iformat)) {
+        whole -= ToSeconds(start_);
+    }
     info_.durationKnown = whole > 0 && !guessedByRate;
     if (!info_.durationKnown) {
         if (const double last = LastStampSeconds(); last > 0) {

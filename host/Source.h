@@ -88,6 +88,7 @@ private:
     void ChooseStreams(SourceChoice choice);
     void DescribePictures(int index);
     void DescribeSound(int index);
+    double EndOf(const AVStream* stream) const;
     void FindDuration();
     double LastStampSeconds();
 

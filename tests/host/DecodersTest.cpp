@@ -73,6 +73,7 @@ class DecodersSeek : public testing::TestWithParam<SeekCase> {};
 
 TEST_P(DecodersSeek, StartExactlyAtTheBeginTime) {
     Movie movie(GetParam().movie(), {});
+    EXPECT_NEAR(movie.Info().duration, 4, 0.06);
     const double begin = GetParam().begin;
     const Seen seen = TakeAll(movie, begin);
     ASSERT_FALSE(seen.pictures.empty());
@@ -92,6 +93,9 @@ std::string CountedMkv() {
     return Make("counted.mkv", Join(CountedPictures(4), Beeps(4),
                                     Args{"-c:v", "mpeg4", "-q:v", "2", "-g", "30", "-c:a", "pcm_s16le"}));
 }
+std::string CountedFromTen() {
+    return Make("from-ten.mkv", {"-i", CountedMkv(), "-c", "copy", "-output_ts_offset", "10"});
+}
 std::string CountedOneKeyPicture() {
     return Make("onekey.mp4", Join(CountedPictures(4), Beeps(4), H264Aac(), Args{"-g", "1000"}));
 }
@@ -103,6 +107,7 @@ const SeekCase kSeekCases[] = {
     {"NearTheStart", Counted4s, 0.05, 1},
     {"TransportStream", CountedTs, 2.5, 62},
     {"Matroska", CountedMkv, 2.41, 60},
+    {"ClockThatStartsAtTenSeconds", CountedFromTen, 2.41, 60},
     {"FarFromAKeyPicture", CountedOneKeyPicture, 3.0, 75},
 };
 INSTANTIATE_TEST_SUITE_P(Movies, DecodersSeek, testing::ValuesIn(kSeekCases),
@@ -186,9 +191,10 @@ TEST(Decoders, KeepTheFormOfSoundThatChangesOnTheWay) {
 }
 
 TEST(Decoders, FillTheTimeBeforeLateSound) {
-    const std::string path = Make("late.mkv", Join(CountedPictures(4), Args{"-itsoffset", "1.3"}, Beeps(2),
+    const std::string path = Make("late.mov", Join(CountedPictures(4), Args{"-itsoffset", "1.3"}, Beeps(2),
                                                    Args{"-c:v", "mpeg4", "-q:v", "2", "-c:a", "pcm_s16le"}));
     Movie movie(path, {});
+    EXPECT_NEAR(movie.Info().sound->duration, 3.3, 0.01);
     const Seen seen = TakeAll(movie);
     EXPECT_EQ(seen.soundBegin, 0);
     EXPECT_NEAR(static_cast<double>(seen.sound.size()), 3.3 * 44100, 60);
