@@ -52,24 +52,26 @@ bool Demuxer::Seek(double seconds) {
         return soughtWell_ && seconds == soughtSeconds_;
     }
     soughtSeconds_ = seconds;
-    soughtWell_ = false;
+    soughtWell_ = source_.IsSeekable() && (SeekBefore(seconds) || source_.Rewind());
+    return soughtWell_;
+}
+
+/// Goes to a time from which `seconds` can be decoded. Containers seek by decoding order or land beside a key
+/// picture, so it goes back until one lies before. False when there is none after the source's start.
+bool Demuxer::SeekBefore(double seconds) {
     AVFormatContext* context = source_.Context();
     const int64_t start = context->start_time != AV_NOPTS_VALUE ? context->start_time : 0;
-    // Containers seek by decoding order or land beside a key picture, so go back until one lies before the
-    // target.
-    for (double back = kPreroll; !soughtWell_; back = 2 * back + 1) {
-        const bool fromStart = back >= seconds;
-        const int64_t target = start + (fromStart ? 0 : std::llround((seconds - back) * AV_TIME_BASE));
-        if (avformat_seek_file(context, -1, INT64_MIN, target, target, 0) < 0) {
-            break;
+    for (double back = kPreroll; back < seconds; back = 2 * back + 1) {
+        const int64_t target = start + std::llround((seconds - back) * AV_TIME_BASE);
+        const auto seek = [&] { return avformat_seek_file(context, -1, INT64_MIN, target, target, 0) >= 0; };
+        if (!seek()) {
+            return false;
         }
-        soughtWell_ = fromStart || KeyPictureAtOrBefore(ToMediaTime(seconds));
-        if (soughtWell_ && avformat_seek_file(context, -1, INT64_MIN, target, target, 0) < 0) {
-            soughtWell_ = false;
-            break;
+        if (KeyPictureAtOrBefore(ToMediaTime(seconds))) {
+            return seek();
         }
     }
-    return soughtWell_;
+    return false;
 }
 
 /// Whether the first key picture from here on is shown at `mediaTime` or earlier. True without a picture

@@ -67,6 +67,7 @@ private:
     void Fail(const std::exception_ptr& failure) noexcept;
     bool AwaitDemand();
     bool ReadOne();
+    bool SeekBefore(double seconds);
     bool KeyPictureAtOrBefore(int64_t mediaTime);
     bool Holds(std::size_t packets, std::size_t bytes) const;
     void RepairClock(AVPacket& packet);

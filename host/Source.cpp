@@ -217,14 +217,16 @@ void Source::DescribeSound(int index) {
     info_.sound = info;
 }
 
+/// When a stream begins, from the start of the source.
+double Source::BeginOf(const AVStream* stream) const {
+    return stream->start_time != AV_NOPTS_VALUE ? ToSeconds(MediaTime(stream->start_time, stream)) : 0;
+}
+
 /// When a stream ends, from the start of the source; 0 when it does not tell. It may begin later than others.
 double Source::EndOf(const AVStream* stream) const {
-    if (stream->duration <= 0) {
-        return 0;
-    }
-    const bool tellsBegin = stream->start_time != AV_NOPTS_VALUE;
-    const double begin = tellsBegin ? ToSeconds(MediaTime(stream->start_time, stream)) : 0;
-    return begin + static_cast<double>(stream->duration) * av_q2d(stream->time_base);
+    return stream->duration > 0
+               ? BeginOf(stream) + static_cast<double>(stream->duration) * av_q2d(stream->time_base)
+               : 0;
 }
 
 void Source::FindDuration() {
@@ -262,7 +264,7 @@ void Source::FindDuration() {
 /// Where the last packet ends, found by reading the end of the file. 0 when the file cannot be read that way.
 /// That may describe the streams anew, as they are there; for the decoders they are as at the beginning.
 double Source::LastStampSeconds() {
-    if (input_->pb == nullptr || (input_->pb->seekable & AVIO_SEEKABLE_NORMAL) == 0) {
+    if (!IsSeekable()) {
         return 0;
     }
     constexpr int64_t kTail = 2 << 20;
@@ -289,12 +291,35 @@ double Source::LastStampSeconds() {
     for (std::size_t i = 0; i < beginnings.size(); ++i) {
         CopyParameters(*beginnings[i], input_->streams[i]->codecpar);
     }
-    const int64_t start = input_->start_time != AV_NOPTS_VALUE ? input_->start_time : 0;
-    if (avformat_seek_file(input_.get(), -1, INT64_MIN, start, start, 0) < 0 &&
-        avformat_seek_file(input_.get(), -1, 0, 0, 0, AVSEEK_FLAG_BYTE) < 0) {
+    if (!Rewind()) {
         throw SourceError("cannot read \"" + info_.path + "\" from its start again");
     }
     return last;
+}
+
+bool Source::IsSeekable() const {
+    return input_->pb != nullptr && (input_->pb->seekable & AVIO_SEEKABLE_NORMAL) != 0;
+}
+
+bool Source::Rewind() {
+    const int flags = input_->iformat->flags;
+    const auto toFirstByte = [&] {
+        return (flags & AVFMT_NO_BYTE_SEEK) == 0 &&
+               avformat_seek_file(input_.get(), -1, 0, 0, 0, AVSEEK_FLAG_BYTE) >= 0;
+    };
+    // In streams for broadcast the first time lies behind the first key picture, which is decoded earlier.
+    if ((flags & AVFMT_TS_DISCONT) != 0 && toFirstByte()) {
+        return true;
+    }
+    // By the stream that begins first, lest the others be skipped up to where the usual one begins.
+    const AVStream* first = PictureStream();
+    if (const AVStream* sound = SoundStream();
+        sound != nullptr && (first == nullptr || BeginOf(sound) < BeginOf(first))) {
+        first = sound;
+    }
+    const int64_t start = first->start_time != AV_NOPTS_VALUE ? first->start_time : 0;
+    const int64_t earlier = start - av_rescale_q(1, {1, 1}, first->time_base);
+    return avformat_seek_file(input_.get(), first->index, INT64_MIN, earlier, start, 0) >= 0 || toFirstByte();
 }
 
 const AVStream* Source::PictureStream() const {

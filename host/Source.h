@@ -80,6 +80,12 @@ public:
     /// A stamp of `stream` in media time, from the start of the source.
     int64_t MediaTime(int64_t stamp, const AVStream* stream) const;
 
+    /// False for a pipe: trying to seek would lose what was read ahead.
+    bool IsSeekable() const;
+
+    /// Goes back to the first packet. False when it fails; where the source is then is not known.
+    bool Rewind();
+
     /// Makes every read fail from now on, also one that is under way.
     void Interrupt() { file_->Interrupt(); }
 
@@ -88,6 +94,7 @@ private:
     void ChooseStreams(SourceChoice choice);
     void DescribePictures(int index);
     void DescribeSound(int index);
+    double BeginOf(const AVStream* stream) const;
     double EndOf(const AVStream* stream) const;
     void FindDuration();
     double LastStampSeconds();

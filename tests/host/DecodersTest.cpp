@@ -6,7 +6,9 @@
 #include <gtest/gtest.h>
 
 #include <cmath>
+#include <fcntl.h>
 #include <thread>
+#include <unistd.h>
 
 namespace {
 
@@ -106,6 +108,7 @@ const SeekCase kSeekCases[] = {
     {"JustAfterAKeyPicture", Counted4s, 1.25, 31},
     {"NearTheStart", Counted4s, 0.05, 1},
     {"TransportStream", CountedTs, 2.5, 62},
+    {"TransportStreamBeforeItsSecondKeyPicture", CountedTs, 0.83, 20},
     {"Matroska", CountedMkv, 2.41, 60},
     {"ClockThatStartsAtTenSeconds", CountedFromTen, 2.41, 60},
     {"FarFromAKeyPicture", CountedOneKeyPicture, 3.0, 75},
@@ -213,6 +216,9 @@ TEST(Decoders, HoldTheFirstPictureWhenSoundBeginsFirst) {
     EXPECT_EQ(seen.pictures[0].time, 0);
     EXPECT_NEAR(seen.pictures[1].time, 0.76, 0.001);
     EXPECT_EQ(seen.soundBegin, 0);
+
+    Movie part(path, {});
+    EXPECT_EQ(Beginnings(TakeAll(part, 0.04), 44100).size(), 3u);
 }
 
 TEST(Decoders, TurnPicturesUpright) {
@@ -344,6 +350,17 @@ TEST(Decoders, JoinRecordingsThatStartANewClock) {
     }
 }
 
+/// The name of a pipe that the file has been written into.
+std::string Piped(const std::string& path) {
+    const std::string bytes = ReadFile(path);
+    int ends[2];
+    EXPECT_EQ(pipe2(ends, O_CLOEXEC), 0);
+    EXPECT_GE(fcntl(ends[1], F_SETPIPE_SZ, 1 << 20), static_cast<int>(bytes.size()));
+    EXPECT_EQ(write(ends[1], bytes.data(), bytes.size()), static_cast<ssize_t>(bytes.size()));
+    close(ends[1]);
+    return "/dev/fd/" + std::to_string(ends[0]);
+}
+
 TEST(Decoders, EstimateTheLengthOfAStreamThatTellsNone) {
     Movie movie(Make("raw.h264", Join(CountedPictures(4), Args{"-c:v", "libx264", "-preset", "veryfast"})),
                 {});
@@ -352,6 +369,11 @@ TEST(Decoders, EstimateTheLengthOfAStreamThatTellsNone) {
     const Seen seen = TakeAll(movie);
     EXPECT_EQ(seen.pictures.size(), 100u);
     EXPECT_NEAR(seen.pictures.back().time, 3.96, 0.05);
+
+    for (const std::string& path : {movie.Info().path, Piped(movie.Info().path)}) {
+        Movie part(path, {});
+        EXPECT_EQ(TakeAll(part, 0.4).pictures.size(), 90u) << path;
+    }
 }
 
 TEST(Decoders, LeaveOutWhatIsNotAskedFor) {
