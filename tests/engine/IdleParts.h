@@ -6,6 +6,9 @@
 
 #include <cstdint>
 
+/// A count for what has to be stopped.
+constexpr int64_t kEndless = 1'000'000'000;
+
 /// `count` black pictures, 25 a second.
 class IdleVideo : public VideoDecoder {
 public:

@@ -187,7 +187,8 @@ int ScriptedHost::Start(double begin, double length) {
 }
 
 std::string ScriptedHost::Convert(double begin, double length) {
-    Start(begin, length);
+    if (const int result = Start(begin, length); result != 0)
+        Note("start -> %d", result);
     MCWait(handle, MC_INFINITE);
     return TraceWithoutLog();
 }

@@ -113,7 +113,8 @@ public:
     /// Creates the converter unless it exists, and starts it with the callback.
     int Start(double begin = 0.0, double length = 0.0);
 
-    /// Starts, waits for the end and returns the trace without log lines.
+    /// Starts, waits for the end and returns the trace without log lines. Notes a failure to start:
+    ///     start -> RESULT
     std::string Convert(double begin = 0.0, double length = 0.0);
 
     static unsigned Callback(void* context, unsigned kind, unsigned value, uintptr_t info);

@@ -15,8 +15,6 @@ unsigned ReadRecord(void*, unsigned, unsigned, uintptr_t info) {
     return 1;
 }
 
-constexpr int64_t kEndless = 1'000'000'000;
-
 struct Loop {
     const char* name;
     int64_t pictures, blocks;
@@ -82,24 +80,5 @@ INSTANTIATE_TEST_SUITE_P(Loops, StressTest,
                          testing::Values(Loop{"AudioVideo", kEndless, kEndless}, Loop{"Audio", 0, kEndless},
                                          Loop{"Video", kEndless, 0}),
                          [](const auto& info) { return info.param.name; });
-
-// Stops of several threads run one after the other, and all return.
-TEST(StopTest, SeveralThreadsStop) {
-    IdleVideo video(kEndless);
-    recorder::Reset();
-    const MCHandle handle = MCCreate(&video, nullptr);
-    for (int round = 0; round < 10; ++round) {
-        ASSERT_EQ(MCStart(handle, 0.0, 0.0, nullptr, nullptr, nullptr), 0);
-        std::thread threads[3];
-        for (std::thread& thread : threads)
-            thread = std::thread([=] {
-                MCStop(handle);
-                EXPECT_EQ(MCWait(handle, 0), 0);
-            });
-        for (std::thread& thread : threads)
-            thread.join();
-    }
-    MCDestroy(handle);
-}
 
 } // namespace
