@@ -17,14 +17,9 @@ struct Pair {
 
 std::string Name(const testing::TestParamInfo<Pair>& info) {
     std::string name;
-    for (const uint32_t code : {info.param.format, info.param.video, info.param.audio}) {
-        for (const char character : code == 0 ? std::string("none") : writer::CodeText(code)) {
-            if (character != ' ')
-                name += character;
-        }
-        name += '_';
-    }
-    name.pop_back();
+    for (const uint32_t code : {info.param.format, info.param.video, info.param.audio})
+        name += (name.empty() ? "" : "_") + (code == 0 ? "none" : writer::CodeText(code));
+    std::erase(name, ' ');
     return name;
 }
 

@@ -118,6 +118,7 @@ TEST(MediaWriter, RefusesTargetsThatAreNotFiles) {
     EXPECT_EQ(TestMovie().Create("/dev/null"), nullptr);
     EXPECT_EQ(Latest().nError, kWriterErrorOpen);
     EXPECT_EQ(TestMovie().Create(folder / "missing/movie"), nullptr);
+    EXPECT_EQ(Latest().nError, kWriterErrorOpen);
     EXPECT_EQ(Latest().nSystemError, ENOENT);
 }
 
