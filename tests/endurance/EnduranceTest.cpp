@@ -3,6 +3,7 @@
 // recording writer, and for the whole with the real one.
 #include "api/MovieConv.h"
 #include "tests/engine/IdleParts.h"
+#include "tests/support/Folder.h"
 
 #ifdef MOVIECONV_RECORDED
 #include "tests/recorder/RecordingWriter.h"
@@ -14,14 +15,12 @@
 #include <chrono>
 #include <cstdlib>
 #include <filesystem>
-#include <iterator>
 #include <memory>
 #include <random>
 #include <string>
 #include <thread>
 
 #include <malloc.h>
-#include <unistd.h>
 
 namespace {
 
@@ -36,19 +35,14 @@ int Rounds() {
     return asked ? std::max(std::atoi(asked), kWarmUpRounds + 1) : 150;
 }
 
-int64_t Entries(const char* folder) {
-    const std::filesystem::directory_iterator entries(folder);
-    return std::distance(begin(entries), end(entries));
-}
-
 /// Bytes on the heap that are in use, of all threads together.
 int64_t Memory() {
     return static_cast<int64_t>(mallinfo2().uordblks);
 }
 
 struct Usage {
-    int64_t threads = Entries("/proc/self/task");
-    int64_t descriptors = Entries("/proc/self/fd");
+    int64_t threads = CountEntries("/proc/self/task");
+    int64_t descriptors = CountEntries("/proc/self/fd");
     int64_t memory = Memory();
 };
 
@@ -124,16 +118,15 @@ void Round(std::mt19937& random, const std::wstring& folder) {
 }
 
 TEST(EnduranceTest, NothingPilesUp) {
-    const std::filesystem::path folder = testing::TempDir() + "endurance-" + std::to_string(getpid());
-    std::filesystem::create_directory(folder);
+    const Folder folder;
+    const std::wstring path = std::filesystem::path(folder.Path()).wstring();
     std::mt19937 random(20);
     for (int i = 0; i < kWarmUpRounds; ++i)
-        Round(random, folder.wstring());
+        Round(random, path);
     const Usage before;
     for (int i = kWarmUpRounds; i < Rounds(); ++i)
-        Round(random, folder.wstring());
+        Round(random, path);
     const Usage after;
-    std::filesystem::remove_all(folder);
     EXPECT_LE(after.threads, before.threads);
     EXPECT_LE(after.descriptors, before.descriptors);
 #if !defined(__SANITIZE_ADDRESS__) && !defined(__SANITIZE_THREAD__) // these keep freed memory

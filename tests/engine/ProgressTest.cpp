@@ -154,12 +154,12 @@ TEST(RecordTest, StampsAloneAreChanged) {
         VideoImage expected = *host.video.Image(i);
         expected.llTime -= 3000000;
         expected.llTime2 -= 3000000;
-        EXPECT_EQ(std::memcmp(&pictures[i].record, &expected, sizeof expected), 0);
+        EXPECT_EQ(std::memcmp(&pictures[i], &expected, sizeof expected), 0);
     }
     for (size_t i = 0; i < 3; ++i) {
         AudioFrame expected = host.audio.Block(i);
         expected.llTime = expected.llTime2 = 200000 + static_cast<int64_t>(i) * 500000;
-        EXPECT_EQ(std::memcmp(&sounds[i].record, &expected, sizeof expected), 0);
+        EXPECT_EQ(std::memcmp(&sounds[i], &expected, sizeof expected), 0);
     }
 }
 
@@ -172,7 +172,7 @@ TEST(RecordTest, SoundAloneIsHandedOnUnchanged) {
     ASSERT_EQ(sounds.size(), 3U);
     for (size_t i = 0; i < 3; ++i) {
         const AudioFrame expected = host.audio.Block(i);
-        EXPECT_EQ(std::memcmp(&sounds[i].record, &expected, sizeof expected), 0);
+        EXPECT_EQ(std::memcmp(&sounds[i], &expected, sizeof expected), 0);
     }
 }
 
@@ -184,10 +184,10 @@ TEST(RecordTest, ClipsOfPicturesMoveBothStamps) {
     host.Convert();
     const auto pictures = recorder::Pictures();
     ASSERT_EQ(pictures.size(), 3U);
-    EXPECT_EQ(+pictures[0].record.llTime2, 1007);
-    EXPECT_EQ(+pictures[1].record.llTime2, 1000);
-    EXPECT_EQ(+pictures[2].record.llTime2, 3000);
-    EXPECT_EQ(pictures[2].record.nDuration, 2);
+    EXPECT_EQ(+pictures[0].llTime2, 1007);
+    EXPECT_EQ(+pictures[1].llTime2, 1000);
+    EXPECT_EQ(+pictures[2].llTime2, 3000);
+    EXPECT_EQ(pictures[2].nDuration, 2);
 }
 
 TEST(RecordTest, SilenceIsOfTheOutputsFormat) {
@@ -207,14 +207,14 @@ TEST(RecordTest, SilenceIsOfTheOutputsFormat) {
     expected.nSampleRate = 44100;
     expected.nChannels = 3;
     expected.nBitsPerSample = 24;
-    expected.pData = sounds[0].record.pData;
+    expected.pData = sounds[0].pData;
     expected.nBufferSize = 1048576;
     const int64_t steps[] = {400000, 400000, 200001};
     expected.llTime = expected.llTime2 = -1;
     for (size_t i = 0; i < 3; ++i) {
         expected.nLength = i < 2 ? 15876 : 7938;
         expected.nDuration = static_cast<int32_t>(steps[i]);
-        EXPECT_EQ(std::memcmp(&sounds[i].record, &expected, sizeof expected), 0) << i;
+        EXPECT_EQ(std::memcmp(&sounds[i], &expected, sizeof expected), 0) << i;
         expected.llTime = expected.llTime2 += steps[i];
     }
 }
@@ -230,7 +230,7 @@ TEST(RecordTest, SilenceStaysInItsBuffer) {
     });
     host.Convert();
     ASSERT_EQ(recorder::Sounds().size(), 3U);
-    EXPECT_EQ(recorder::Sounds()[0].record.nLength, 1048576);
+    EXPECT_EQ(recorder::Sounds()[0].nLength, 1048576);
 }
 
 } // namespace

@@ -5,13 +5,14 @@
 #include <algorithm>
 #include <cstdio>
 #include <mutex>
+#include <utility>
 
 namespace {
 
 struct State {
     std::vector<std::string> trace;
-    std::vector<recorder::Written<AudioFrame>> sounds;
-    std::vector<recorder::Written<VideoImage>> pictures;
+    std::vector<AudioFrame> sounds;
+    std::vector<VideoImage> pictures;
     std::vector<EncodeParam> params;
     std::set<int> failing;
     const FileFormatInfo* formats = nullptr;
@@ -21,6 +22,18 @@ struct State {
 
 std::mutex g_mutex;
 State g_state;
+
+template <class Value>
+Value Get(Value State::*member) {
+    const std::lock_guard guard(g_mutex);
+    return g_state.*member;
+}
+
+template <class Value>
+void Set(Value State::*member, Value value) {
+    const std::lock_guard guard(g_mutex);
+    g_state.*member = std::move(value);
+}
 
 /// Whether a block is the engine's silence. Of a long one only the first 64 KiB are looked at.
 bool IsSilence(const AudioFrame& frame) {
@@ -55,10 +68,7 @@ int Number(const void* file) {
 
 /// Calls a hook with nothing locked, since it may take its time.
 void Call(std::function<void()> State::*member) {
-    std::unique_lock guard(g_mutex);
-    const std::function<void()> hook = g_state.*member;
-    guard.unlock();
-    if (hook)
+    if (const auto hook = Get(member))
         hook();
 }
 
@@ -77,50 +87,41 @@ void Note(std::string_view line) {
 }
 
 std::vector<std::string> Trace() {
-    const std::lock_guard guard(g_mutex);
-    return g_state.trace;
+    return Get(&State::trace);
 }
 
-std::vector<Written<AudioFrame>> Sounds() {
-    const std::lock_guard guard(g_mutex);
-    return g_state.sounds;
+std::vector<AudioFrame> Sounds() {
+    return Get(&State::sounds);
 }
 
-std::vector<Written<VideoImage>> Pictures() {
-    const std::lock_guard guard(g_mutex);
-    return g_state.pictures;
+std::vector<VideoImage> Pictures() {
+    return Get(&State::pictures);
 }
 
 std::vector<EncodeParam> Params() {
-    const std::lock_guard guard(g_mutex);
-    return g_state.params;
+    return Get(&State::params);
 }
 
 void FailCreates(std::set<int> numbers) {
-    const std::lock_guard guard(g_mutex);
-    g_state.failing = std::move(numbers);
+    Set(&State::failing, std::move(numbers));
 }
 
 void SetFormatTable(const FileFormatInfo* table) {
-    const std::lock_guard guard(g_mutex);
-    g_state.formats = table;
+    Set(&State::formats, table);
 }
 
 void OnWrite(std::function<void()> hook) {
-    const std::lock_guard guard(g_mutex);
-    g_state.onWrite = std::move(hook);
+    Set(&State::onWrite, std::move(hook));
 }
 
 void OnClose(std::function<void()> hook) {
-    const std::lock_guard guard(g_mutex);
-    g_state.onClose = std::move(hook);
+    Set(&State::onClose, std::move(hook));
 }
 
 } // namespace recorder
 
 const FileFormatInfo* MWGetFileFormatInfos() {
-    const std::lock_guard guard(g_mutex);
-    return g_state.formats;
+    return Get(&State::formats);
 }
 
 void* MWCreateMediaFile(const wchar_t* fileName, const EncodeParam* param, const VideoFormat* video,
@@ -139,7 +140,7 @@ void* MWCreateMediaFile(const wchar_t* fileName, const EncodeParam* param, const
 int MWWriteVideoFrame(void* file, const VideoImage* image) {
     Call(&State::onWrite);
     const std::lock_guard guard(g_mutex);
-    g_state.pictures.push_back({Number(file), *image});
+    g_state.pictures.push_back(*image);
     g_state.trace.push_back(Format("picture #%d %lld", Number(file), static_cast<long long>(image->llTime)));
     return file != nullptr;
 }
@@ -147,7 +148,7 @@ int MWWriteVideoFrame(void* file, const VideoImage* image) {
 int MWWriteAudioData(void* file, const AudioFrame* frame) {
     Call(&State::onWrite);
     const std::lock_guard guard(g_mutex);
-    g_state.sounds.push_back({Number(file), *frame});
+    g_state.sounds.push_back(*frame);
     g_state.trace.push_back(Format("%s #%d %lld +%d", IsSilence(*frame) ? "silence" : "sound", Number(file),
                                    static_cast<long long>(frame->llTime), frame->nLength));
     return file != nullptr;

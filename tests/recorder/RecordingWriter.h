@@ -22,13 +22,6 @@
 
 namespace recorder {
 
-/// One record that reached the writer.
-template <class Record>
-struct Written {
-    int file; // number of the file since Reset, from 1; 0 for a null handle
-    Record record;
-};
-
 /// Forgets all recordings and everything that was set below.
 void Reset();
 
@@ -44,8 +37,8 @@ void Note(std::string_view line);
 std::vector<std::string> Trace();
 
 /// The records of the writes since Reset.
-std::vector<Written<AudioFrame>> Sounds();
-std::vector<Written<VideoImage>> Pictures();
+std::vector<AudioFrame> Sounds();
+std::vector<VideoImage> Pictures();
 
 /// The parameters of the creates since Reset.
 std::vector<EncodeParam> Params();

@@ -3,6 +3,7 @@
 #define MOVIECONV_TESTS_SUPPORT_FOLDER_H
 
 #include <algorithm>
+#include <cstdint>
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
@@ -41,6 +42,12 @@ public:
 private:
     std::string path_;
 };
+
+/// How many entries a folder has.
+inline int64_t CountEntries(const std::string& path) {
+    const std::filesystem::directory_iterator entries(path);
+    return std::distance(begin(entries), end(entries));
+}
 
 /// What is in a file; nothing when it cannot be read.
 inline std::string ReadFile(const std::string& path) {

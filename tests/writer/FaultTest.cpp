@@ -12,7 +12,6 @@
 #include <cerrno>
 #include <cstring>
 #include <filesystem>
-#include <iterator>
 #include <memory>
 #include <string>
 #include <thread>
@@ -247,11 +246,6 @@ TEST_F(Fault, TheListenerHearsOfItOnceWhileTheConversionGoesOn) {
     EXPECT_EQ(events, (std::vector<int>{kWriterEventFailed, kWriterEventClosed}));
 }
 
-size_t CountEntries(const char* folder) {
-    const std::filesystem::directory_iterator entries(folder);
-    return static_cast<size_t>(std::distance(begin(entries), end(entries)));
-}
-
 TEST_F(Fault, NeitherFilesNorThreadsAreLeftBehind) {
     movie_.pictures = 10;
     movie_.soundSeconds = 0.4;
@@ -264,8 +258,8 @@ TEST_F(Fault, NeitherFilesNorThreadsAreLeftBehind) {
         MWCloseMediaFile(movie_.Create(folder_ / "no/such/folder/movie"), nullptr, nullptr);
     };
     runAll();
-    const size_t descriptors = CountEntries("/proc/self/fd");
-    const size_t threads = CountEntries("/proc/self/task");
+    const int64_t descriptors = CountEntries("/proc/self/fd");
+    const int64_t threads = CountEntries("/proc/self/task");
     for (int round = 0; round < 5; ++round)
         runAll();
     EXPECT_EQ(CountEntries("/proc/self/fd"), descriptors);

@@ -29,27 +29,26 @@ void TakePicture(const AVFrame& frame, AVRational unit, ReadMovie& movie) {
 }
 
 template <class Sample>
-Sample Load(const uint8_t* data, size_t index) {
+float Load(const uint8_t* data) {
     Sample sample;
-    std::memcpy(&sample, data + index * sizeof(Sample), sizeof(Sample));
-    return sample;
+    std::memcpy(&sample, data, sizeof sample);
+    return static_cast<float>(sample);
 }
 
+/// A sample of the first channel.
 float SampleAt(const AVFrame& frame, int index) {
-    const int stride = av_sample_fmt_is_planar(static_cast<AVSampleFormat>(frame.format)) != 0
-                           ? 1
-                           : frame.ch_layout.nb_channels;
-    const uint8_t* data = frame.extended_data[0];
-    const auto at = static_cast<size_t>(index) * stride;
-    switch (av_get_packed_sample_fmt(static_cast<AVSampleFormat>(frame.format))) {
+    const auto format = static_cast<AVSampleFormat>(frame.format);
+    const int step = av_sample_fmt_is_planar(format) != 0 ? 1 : frame.ch_layout.nb_channels;
+    const uint8_t* data = frame.data[0] + ptrdiff_t{index} * step * av_get_bytes_per_sample(format);
+    switch (av_get_packed_sample_fmt(format)) {
     case AV_SAMPLE_FMT_U8:
-        return static_cast<float>(data[at] - 128) / 128.0F;
+        return Load<uint8_t>(data) / 128.0F - 1.0F;
     case AV_SAMPLE_FMT_S16:
-        return static_cast<float>(Load<int16_t>(data, at)) / 32768.0F;
+        return Load<int16_t>(data) / 32768.0F;
     case AV_SAMPLE_FMT_S32:
-        return static_cast<float>(Load<int32_t>(data, at)) / 2147483648.0F;
+        return Load<int32_t>(data) / 2147483648.0F;
     case AV_SAMPLE_FMT_FLT:
-        return Load<float>(data, at);
+        return Load<float>(data);
     default:
         return 0;
     }

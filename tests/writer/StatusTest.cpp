@@ -65,49 +65,44 @@ TEST(MediaWriter, RefusesRecordsThatMakeNoSense) {
     EXPECT_EQ(Latest().llSamplesReceived, 100);
 }
 
-struct Refusal {
-    const char* name;
-    void (*spoil)(TestMovie&);
-    int error;
-};
-
-class Refusals : public testing::TestWithParam<Refusal> {};
-
-TEST_P(Refusals, GiveNullAndTheReason) {
-    const Folder folder;
-    TestMovie movie;
-    GetParam().spoil(movie);
-    EXPECT_EQ(movie.Create(folder / "movie"), nullptr);
-    WriterStatus status{};
-    ASSERT_EQ(MWGetLastFailure(&status), 1);
-    EXPECT_EQ(status.nError, GetParam().error);
-    EXPECT_EQ(status.nState, kWriterFileFailed);
-    EXPECT_EQ(status.szPath, folder / "movie");
-    EXPECT_NE(std::string(status.szWhat), "");
-    EXPECT_TRUE(folder.Names().empty());
+TEST(MediaWriter, GivesNullAndTheReason) {
+    const struct {
+        const char* name;
+        void (*spoil)(TestMovie&);
+        int error;
+    } refusals[] = {
+        {"UnknownFormat", [](TestMovie& movie) { movie.param.fccFileFormat = FourCC("XXXX"); },
+         kWriterErrorFormat},
+        {"NoFormat", [](TestMovie& movie) { movie.param.fccFileFormat = 0; }, kWriterErrorFormat},
+        {"Copy", [](TestMovie& movie) { movie.param.fccFileFormat = FourCC("COPY"); }, kWriterErrorFormat},
+        {"UnknownVideo", [](TestMovie& movie) { movie.param.fccVideo = FourCC("ABCD"); }, kWriterErrorCodec},
+        {"NoVideoCodec", [](TestMovie& movie) { movie.param.fccVideo = 0; }, kWriterErrorCodec},
+        {"VideoThatDoesNotFit", [](TestMovie& movie) { movie.param.fccVideo = FourCC("VP80"); },
+         kWriterErrorCodec},
+        {"SoundThatDoesNotFit", [](TestMovie& movie) { movie.param.fccAudio = FourCC("PCM "); },
+         kWriterErrorCodec},
+        {"NegativeSize", [](TestMovie& movie) { movie.param.nWidth = -160; }, kWriterErrorArgument},
+        {"NoSize", [](TestMovie& movie) { movie.width = 0; }, kWriterErrorArgument},
+        {"NoStream", [](TestMovie& movie) { movie.hasVideo = movie.hasAudio = false; }, kWriterErrorArgument},
+        {"BothLeftOut", [](TestMovie& movie) { movie.param.bNoVideo = movie.param.bNoAudio = 1; },
+         kWriterErrorArgument},
+        {"NoRate", [](TestMovie& movie) { movie.sampleRate = 0; }, kWriterErrorArgument},
+    };
+    for (const auto& refusal : refusals) {
+        SCOPED_TRACE(refusal.name);
+        const Folder folder;
+        TestMovie movie;
+        refusal.spoil(movie);
+        EXPECT_EQ(movie.Create(folder / "movie"), nullptr);
+        WriterStatus status{};
+        ASSERT_EQ(MWGetLastFailure(&status), 1);
+        EXPECT_EQ(status.nError, refusal.error);
+        EXPECT_EQ(status.nState, kWriterFileFailed);
+        EXPECT_EQ(status.szPath, folder / "movie");
+        EXPECT_NE(std::string(status.szWhat), "");
+        EXPECT_TRUE(folder.Names().empty());
+    }
 }
-
-constexpr Refusal kRefusals[] = {
-    {"UnknownFormat", [](TestMovie& movie) { movie.param.fccFileFormat = FourCC("XXXX"); },
-     kWriterErrorFormat},
-    {"NoFormat", [](TestMovie& movie) { movie.param.fccFileFormat = 0; }, kWriterErrorFormat},
-    {"Copy", [](TestMovie& movie) { movie.param.fccFileFormat = FourCC("COPY"); }, kWriterErrorFormat},
-    {"UnknownVideo", [](TestMovie& movie) { movie.param.fccVideo = FourCC("ABCD"); }, kWriterErrorCodec},
-    {"NoVideoCodec", [](TestMovie& movie) { movie.param.fccVideo = 0; }, kWriterErrorCodec},
-    {"VideoThatDoesNotFit", [](TestMovie& movie) { movie.param.fccVideo = FourCC("VP80"); },
-     kWriterErrorCodec},
-    {"SoundThatDoesNotFit", [](TestMovie& movie) { movie.param.fccAudio = FourCC("PCM "); },
-     kWriterErrorCodec},
-    {"NegativeSize", [](TestMovie& movie) { movie.param.nWidth = -160; }, kWriterErrorArgument},
-    {"NoSize", [](TestMovie& movie) { movie.width = 0; }, kWriterErrorArgument},
-    {"NoStream", [](TestMovie& movie) { movie.hasVideo = movie.hasAudio = false; }, kWriterErrorArgument},
-    {"BothLeftOut", [](TestMovie& movie) { movie.param.bNoVideo = movie.param.bNoAudio = 1; },
-     kWriterErrorArgument},
-    {"NoRate", [](TestMovie& movie) { movie.sampleRate = 0; }, kWriterErrorArgument},
-};
-
-INSTANTIATE_TEST_SUITE_P(MediaWriter, Refusals, testing::ValuesIn(kRefusals),
-                         [](const auto& info) { return std::string(info.param.name); });
 
 TEST(MediaWriter, RefusesTargetsThatAreNotFiles) {
     const Folder folder;
