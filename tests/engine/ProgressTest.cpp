@@ -219,18 +219,4 @@ TEST(RecordTest, SilenceIsOfTheOutputsFormat) {
     }
 }
 
-// Only so much silence as the buffer holds, however large the output's figures are.
-TEST(RecordTest, SilenceStaysInItsBuffer) {
-    ScriptedHost host;
-    host.video.stamps = Stamps(0, kSecond / 10, 2);
-    host.audio.stamps = {};
-    host.Change([](EncodeParam& param) {
-        param.nSampleRate = 2000000000;
-        param.nChannels = 1000;
-    });
-    host.Convert();
-    ASSERT_EQ(recorder::Sounds().size(), 3U);
-    EXPECT_EQ(recorder::Sounds()[0].nLength, 1048576);
-}
-
 } // namespace

@@ -9,7 +9,11 @@
 
 namespace {
 
-std::atomic<uint32_t> g_ticks{0};
+std::atomic<uint32_t> g_ticks{0}; // what the engine reads as its clock, 10 ms each
+
+void AdvanceClock(uint32_t ms) {
+    g_ticks += ms / 10;
+}
 
 __attribute__((format(printf, 1, 2))) void Note(const char* format, ...) {
     char line[256];
@@ -25,6 +29,36 @@ UInt32 Parameter(EventRef event, EventParamName name) {
     UInt32 value = 0xDEADBEEF;
     GetEventParameter(event, name, 0x55494E54, nullptr, sizeof value, nullptr, &value);
     return value;
+}
+
+std::string Figure(const char* name, double value) {
+    char text[64];
+    snprintf(text, sizeof text, " %s %g", name, value);
+    return text;
+}
+
+/// A record without what is as usual.
+std::string Describe(const ProgressInfo* info) {
+    if (!info)
+        return " without record";
+    std::string text = Figure("at", info->dPosition);
+    if (std::abs(info->dDoneLength - info->dPosition) > 1e-9)
+        text += Figure("done", info->dDoneLength);
+    if (info->dSpeed != 0.0)
+        text += Figure("speed", info->dSpeed);
+    if (info->nPercent != info->nProgress / 100)
+        text += Figure("percent", info->nPercent);
+    if (info->pPreviewImage)
+        text += " preview " + std::to_string(info->pPreviewImage->llTime);
+    return text;
+}
+
+std::string Filter(bool logLines) {
+    std::string lines;
+    for (const std::string& line : recorder::Trace())
+        if ((line.rfind("log ", 0) == 0) == logLines)
+            lines += (logLines ? line.substr(4) : line) + "\n";
+    return lines;
 }
 
 } // namespace
@@ -46,13 +80,6 @@ OSStatus PostEventToQueue(EventQueueRef queue, EventRef event, EventPriority pri
         line += " for window " + std::to_string(window);
     recorder::Note(usual ? line : line + " unusual");
     return noErr;
-}
-
-void SetClock(uint32_t ms) {
-    g_ticks = ms / 10;
-}
-void AdvanceClock(uint32_t ms) {
-    g_ticks += ms / 10;
 }
 
 ScriptedVideo::ScriptedVideo() {
@@ -150,7 +177,7 @@ std::vector<int64_t> Stamps(int64_t first, int64_t step, size_t count) {
 
 ScriptedHost::ScriptedHost() {
     recorder::Reset();
-    SetClock(0xFFFFFF00); // so that every longer test crosses the wrap
+    g_ticks = 0xFFFFFF00 / 10; // so that every longer test crosses the wrap
 }
 
 void ScriptedHost::SetMovie(size_t pictures, size_t blocks) {
@@ -193,60 +220,19 @@ std::string ScriptedHost::Convert(double begin, double length) {
     return TraceWithoutLog();
 }
 
-unsigned ScriptedHost::Callback(void* context, unsigned kind, unsigned value, uintptr_t info) {
-    return static_cast<ScriptedHost*>(context)->OnCallback(kind, value,
-                                                           reinterpret_cast<const ProgressInfo*>(info));
-}
-
-namespace {
-
-std::string Figure(const char* name, double value) {
-    char text[64];
-    snprintf(text, sizeof text, " %s %g", name, value);
-    return text;
-}
-
-/// A record without what is as usual.
-std::string Describe(const ProgressInfo* info) {
-    if (!info)
-        return " without record";
-    std::string text = Figure("at", info->dPosition);
-    if (std::abs(info->dDoneLength - info->dPosition) > 1e-9)
-        text += Figure("done", info->dDoneLength);
-    if (info->dSpeed != 0.0)
-        text += Figure("speed", info->dSpeed);
-    if (info->nPercent != info->nProgress / 100)
-        text += Figure("percent", info->nPercent);
-    if (info->pPreviewImage)
-        text += " preview " + std::to_string(info->pPreviewImage->llTime);
-    return text;
-}
-
-} // namespace
-
-unsigned ScriptedHost::OnCallback(unsigned kind, unsigned value, const ProgressInfo* info) {
+unsigned ScriptedHost::Callback(void* context, unsigned kind, unsigned value, uintptr_t pointer) {
+    auto& host = *static_cast<ScriptedHost*>(context);
+    const auto* info = reinterpret_cast<const ProgressInfo*>(pointer);
     if (info && kind == 0)
-        records.push_back(*info);
+        host.records.push_back(*info);
     const std::string name = kind == 1 ? "finished " : "progress ";
     const bool usual = kind == 1 || !info || info->nProgress == static_cast<int>(value);
     recorder::Note(name + std::to_string(static_cast<int>(value)) + Describe(info) +
                    (usual ? "" : " unusual"));
-    if (onCallback)
-        onCallback(kind, info);
-    return kind == 0 && ++progressCalls == cancelAt ? 0 : 1;
+    if (host.onCallback)
+        host.onCallback(kind, info);
+    return kind == 0 && ++host.progressCalls == host.cancelAt ? 0 : 1;
 }
-
-namespace {
-
-std::string Filter(bool logLines) {
-    std::string lines;
-    for (const std::string& line : recorder::Trace())
-        if ((line.rfind("log ", 0) == 0) == logLines)
-            lines += (logLines ? line.substr(4) : line) + "\n";
-    return lines;
-}
-
-} // namespace
 
 std::string LogLines() {
     return Filter(true);

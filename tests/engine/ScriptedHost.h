@@ -16,10 +16,6 @@
 constexpr int64_t kSecond = 10000000;
 constexpr int64_t kMs = 10000;
 
-/// Sets the clock that the engine reads, in milliseconds; steps of 10 count.
-void SetClock(uint32_t ms);
-void AdvanceClock(uint32_t ms);
-
 /// Plays pictures with the given stamps. Notes
 ///     seek video SECONDS MODE
 ///     image STAMP, or image none
@@ -132,8 +128,6 @@ public:
     std::vector<ProgressInfo> records; // of the progress calls
 
 private:
-    unsigned OnCallback(unsigned kind, unsigned value, const ProgressInfo* info);
-
     unsigned progressCalls = 0;
 };
 

@@ -45,6 +45,13 @@ Setting Into(std::vector<int64_t>& values) {
     return [&values](std::istream& words) { values = Rest<std::vector<int64_t>>(words); };
 }
 
+/// Sets a field of the parameters.
+Setting Into(ScriptedHost& host, int32_t EncodeParam::*field) {
+    return [&host, field](std::istream& words) {
+        host.Change([&](EncodeParam& param) { words >> param.*field; });
+    };
+}
+
 void AbortInCallback(ScriptedHost& host) {
     host.onCallback = [&host](unsigned kind, const ProgressInfo*) {
         if (kind == 0)
@@ -97,10 +104,9 @@ std::map<std::string, Setting> Settings(Script& script) {
         {"abort-after-pictures", [&](std::istream& words) { AbortAfterPicture(host, Next<size_t>(words)); }},
         {"failing-creates", [](std::istream& words) { recorder::FailCreates(Rest<std::set<int>>(words)); }},
         {"split-ms", [&](std::istream& words) { host.Split(Next<unsigned long>(words)); }},
-        {"video-bitrate",
-         [&](std::istream& words) {
-             host.Change([&](EncodeParam& param) { words >> param.nVideoBitrate; });
-         }},
+        {"video-bitrate", Into(host, &EncodeParam::nVideoBitrate)},
+        {"output-sample-rate", Into(host, &EncodeParam::nSampleRate)},
+        {"output-channels", Into(host, &EncodeParam::nChannels)},
         {"file-format", [&](std::istream& words) { SetFileFormat(host, Next<std::string>(words)); }},
         {"name",
          [&](std::istream& words) {

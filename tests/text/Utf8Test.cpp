@@ -24,12 +24,6 @@ TEST(Utf8, InvalidBytesBecomeEscapes) {
     EXPECT_EQ(text::FromUtf8("\xE2\x82z").back(), L'z');
 }
 
-TEST(Utf8, ValuesThatAreNoCharactersAreReplaced) {
-    const std::wstring wide{static_cast<wchar_t>(0xD800), static_cast<wchar_t>(0x110000),
-                            static_cast<wchar_t>(-1)};
-    EXPECT_EQ(text::ToUtf8(wide), "\xEF\xBF\xBD\xEF\xBF\xBD\xEF\xBF\xBD");
-}
-
 TEST(Utf8, AnyBytesSurviveTheRoundTrip) {
     std::mt19937 random(7);
     std::uniform_int_distribution<int> length(0, 40);
