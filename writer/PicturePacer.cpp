@@ -54,7 +54,8 @@ PicturePacer::Showing PicturePacer::Add(int64_t time) {
         origin_ = time;
     if (keepStamps_) {
         const Showing showing = ShowOnce();
-        pending_ = lastTick_ = TickOf(time);
+        pending_ = TickOf(time);
+        lastTick_ = pending_ ? pending_ : lastTick_;
         return showing;
     }
     const int64_t index = GridIndex(time);
@@ -85,14 +86,19 @@ int64_t PicturePacer::GridIndex(int64_t time) const {
     return av_rescale_q(time, kUnit, av_inv_q(clock_.rate));
 }
 
-int64_t PicturePacer::TickOf(int64_t time) {
+/// Nothing for a picture that is left out: where pictures tell the time, those that come faster than the rate
+/// would make it fall behind the sound.
+std::optional<int64_t> PicturePacer::TickOf(int64_t time) {
     const int64_t steps = GridIndex(time - *origin_);
     const int64_t onGrid = *origin_ + av_rescale_q(steps, av_inv_q(clock_.rate), kUnit);
-    const int64_t tolerance = std::min(kGridTolerance, av_rescale_q(1, av_inv_q(clock_.rate), kUnit) / 8);
+    const int64_t length = av_rescale_q(1, av_inv_q(clock_.rate), kUnit);
+    const int64_t tolerance = std::min(kGridTolerance, length / 8);
     const int64_t value = std::abs(time - onGrid) <= tolerance
                               ? av_rescale_q(*origin_, kUnit, clock_.tick) + steps * clock_.ticksPerPicture
                               : av_rescale_q(time, kUnit, clock_.tick);
-    return lastTick_ ? std::max(value, *lastTick_ + 1) : value;
+    const int64_t tick = lastTick_ ? std::max(value, *lastTick_ + 1) : value;
+    const bool isLate = tick > value && av_rescale_q(tick, clock_.tick, kUnit) - time >= length;
+    return clock_.ticksPerPicture == 1 && isLate ? std::nullopt : std::optional(tick);
 }
 
 } // namespace writer

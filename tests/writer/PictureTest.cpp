@@ -130,6 +130,18 @@ TEST(Pictures, StampsOfAVariableRateAreKept) {
         EXPECT_NEAR(read.pictures[i].time, static_cast<double>(times[i]) / 1e7, 0.0002);
 }
 
+TEST(Pictures, TooManyForASteadyRateAreLeftOut) {
+    TestMovie movie = WithoutSound();
+    movie.param.fccFileFormat = FourCC("AVI ");
+    const ReadMovie read = WriteAndRead(movie, [](void* file) {
+        TestPicture picture(160, 120);
+        for (int number = 0; number < 100; ++number) // 2 s, twice as many as announced
+            MWWriteVideoFrame(file, &picture.Paint(number, number * 200'000));
+    });
+    EXPECT_NEAR(static_cast<double>(read.pictures.size()), 50, 1);
+    EXPECT_NEAR(read.pictures.back().time, 1.96, 0.05);
+}
+
 TEST(Pictures, TheFileIsTheSameWhateverTheTiming) {
     WriterOptions options{};
     options.bBitExact = 1;
