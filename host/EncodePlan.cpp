@@ -2,12 +2,15 @@
 
 #include "host/ExitCode.h"
 #include "host/Formats.h"
+#include "media/FourCC.h"
 
 #include <algorithm>
 #include <fmt/format.h>
 
 namespace host {
 namespace {
+
+constexpr uint32_t kSteadyRateFormat = FourCC("AVI "); // leaves out what comes faster than its one rate
 
 uint32_t CodecCode(const std::string& text, const char* option) {
     const auto code = ParseCode(text);
@@ -61,6 +64,8 @@ EncodeParam PlanEncoding(const EncodeParam& defaults, const FileFormatInfo& form
     param.bResize = options.fit == Fit::kStretch ? 1 : 0;
     if (options.frameRate) { // no reference to the record's double, which lies on a 4-byte boundary
         param.dFrameRate = *options.frameRate;
+    } else if (source.pictures && format.fccFormat == kSteadyRateFormat) {
+        param.dFrameRate = source.pictures->peakRate;
     }
     param.nVideoBitrate = options.videoRate.value_or(param.nVideoBitrate);
     param.nVideoMaxBitrate = options.videoMaxRate.value_or(0);

@@ -192,8 +192,12 @@ void Source::DescribePictures(int index) {
     info.height = turned ? parameters->width : parameters->height;
     info.pixelAspect = PixelAspect(input_.get(), stream, turned);
     info.frameRate = av_q2d(FrameRate(stream));
+    info.peakRate = info.frameRate;
     info.duration = EndOf(stream);
     info.interlaced = parameters->field_order > AV_FIELD_PROGRESSIVE;
+    if (IsPlausible(stream->r_frame_rate) && !info.interlaced) { // where it may count fields
+        info.peakRate = std::max(info.frameRate, av_q2d(stream->r_frame_rate));
+    }
     info.colorPrimaries = parameters->color_primaries;
     info.colorTransfer = parameters->color_trc;
     info.colorMatrix = parameters->color_space;

@@ -31,6 +31,7 @@ struct PictureStreamInfo {
     AVRational
         pixelAspect{};    ///< Shape of a pixel as shown, width to height; 1:1 when the source does not tell.
     double frameRate = 0; ///< Average pictures per second.
+    double peakRate = 0;  ///< Pictures per second where they follow each other closest; at least the average.
     double duration = 0;  ///< Seconds; estimated when the container does not tell.
     bool interlaced = false;
     int colorPrimaries = 2; ///< As in ISO/IEC 23091-2; 2: not stated.

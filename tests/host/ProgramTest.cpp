@@ -131,6 +131,7 @@ Args Lossless(double pictureSeconds, double soundSeconds) {
 }
 
 const Args kLateSound = Join(CountedPictures(3), Args{"-itsoffset", "1"}, Beeps(2), kLossless);
+const Args kVariable = Join(CountedPictures(4), Args{"-vf", "select='lt(mod(n,6),3)'", "-fps_mode", "vfr"});
 const Args kSurround = Join(CountedPictures(1), Beeps(1), Args{"-c:v", "mpeg4", "-c:a", "ac3", "-ac", "6"});
 
 // A part has the pictures shown at its begin and at its end, and one more: the engine stops after a picture.
@@ -143,6 +144,7 @@ const Odd kOddities[] = {
     {"short-sound.mkv", Lossless(3, 1), "o.mp4", 75, 3},
     {"long-sound.mkv", Lossless(1, 3), "o.mp4", 25, 3},
     {"late-sound.mkv", kLateSound, "o.avi", 75, 3},
+    {"variable.mp4", kVariable, "o.avi", 100, 0},
     {"plain.mkv", Lossless(2, 2), "o.mkv", 50, 0, {"--no-audio"}},
     {"plain.mkv", Lossless(2, 2), "o.mp3", 0, 2, {"--no-video"}},
     {"plain.mkv", Lossless(2, 2), "o.webm", 27, 1, {"--begin", "0.5", "--length", "1"}},
