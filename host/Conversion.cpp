@@ -63,6 +63,9 @@ Conversion::Conversion(const Options& options, Movie& movie, Reporter& reporter,
       files_(reporter),
       converter_(MakeConverter(options, movie)),
       clock_(Now()) {
+    if (options.length) {
+        movie.EndPicturesAt(options.begin + length_);
+    }
     if (options.preview) {
         preview_.emplace(*options.preview);
     }

@@ -13,6 +13,12 @@ Movie::Movie(const std::string& path, SourceChoice choice) : source_(path, choic
     }
 }
 
+void Movie::EndPicturesAt(double seconds) {
+    if (pictures_) {
+        pictures_->EndAt(seconds);
+    }
+}
+
 void Movie::Stop() {
     demuxer_.Stop();
     if (pictures_) {

@@ -24,6 +24,10 @@ public:
     VideoDecoder* Pictures() { return pictures_.get(); }
     AudioDecoder* Sound() { return sound_.get(); }
 
+    /// Leaves out the pictures from that time on, where the engine would write one more. Only before the
+    /// conversion.
+    void EndPicturesAt(double seconds);
+
     /// Ends both streams at once, so that nobody waits for a slow source. Any thread.
     void Stop();
 

@@ -52,6 +52,10 @@ double PictureDecoder::Seek(double seconds, int /*mode*/) {
     return seconds;
 }
 
+void PictureDecoder::EndAt(double seconds) {
+    end_ = ToMediaTime(seconds);
+}
+
 VideoImage* PictureDecoder::GetCurrentImage() {
     if (!ended_ && !current_.frame) {
         ended_ =
@@ -134,9 +138,12 @@ bool PictureDecoder::Accept(AVFrame& frame) {
     return true;
 }
 
-/// Hands the held picture on, unless it is over before the conversion begins. False when nobody takes it any
-/// more.
+/// Hands the held picture on, unless it is over before the conversion begins. False when that ends before it,
+/// or nobody takes it any more.
 bool PictureDecoder::Deliver(StampRepair::Stamp stamp) {
+    if (end_ && stamp.time >= *end_) {
+        return false;
+    }
     if (begin_ && stamp.time + stamp.duration <= *begin_) {
         return true;
     }

@@ -34,6 +34,9 @@ public:
     VideoImage* GetCurrentImage() override;
     int DecodeNext(int mode) override;
 
+    /// Leaves out the pictures from that time on. Only before the first is taken.
+    void EndAt(double seconds);
+
     /// Makes the pictures end now. Any thread.
     void Stop() { queue_.Close(); }
 
@@ -68,6 +71,7 @@ private:
     StampRepair stamps_;
     av::Frame held_; // decoded, its stamp not settled yet
     std::optional<int64_t> begin_;
+    std::optional<int64_t> end_;
     int64_t decoded_ = 0;
     int64_t skip_ = 0; // frames that a restarted decoder gives once more
     bool first_ = true;
