@@ -214,7 +214,9 @@ AudioEncoder::AudioEncoder(const AudioCodec& codec, const AudioSettings& setting
     : context_(NewContext(FindEncoder(codec, settings.bitsPerSample), codec.code, flags)),
       packet_(av::NewPacket()) {
     AVCodecContext& context = *context_;
-    context.sample_rate = ChooseSampleRate(*context.codec, settings.sampleRate, settings.flashRates);
+    const int rate =
+        codec.maxSampleRate > 0 ? std::min(settings.sampleRate, codec.maxSampleRate) : settings.sampleRate;
+    context.sample_rate = ChooseSampleRate(*context.codec, rate, settings.flashRates);
     context.time_base = {1, context.sample_rate};
     context.sample_fmt = ChooseSampleFormat(*context.codec, settings.bitsPerSample);
     ChooseLayout(*context.codec, std::min(settings.channels, codec.maxChannels), context.ch_layout);

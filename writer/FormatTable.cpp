@@ -49,7 +49,7 @@ constexpr std::array kAudioCodecs{
     AudioCodec{kAc3,    AV_CODEC_ID_AC3,       "ac3",        6, 0.5, 14.0},
     AudioCodec{kFlac,   AV_CODEC_ID_FLAC,      "flac",       8, 0.0, 0.0},
     AudioCodec{kOpus,   AV_CODEC_ID_OPUS,      "libopus",    8, 0.2, 5.3},
-    AudioCodec{kVorbis, AV_CODEC_ID_VORBIS,    "libvorbis",  8, 1.0, 3.8},
+    AudioCodec{kVorbis, AV_CODEC_ID_VORBIS,    "libvorbis",  8, 1.0, 3.8, 48000},
     AudioCodec{kPcm,    AV_CODEC_ID_PCM_S16LE, "pcm_s16le",  8, 0.0, 0.0},
 };
 

@@ -31,8 +31,9 @@ struct AudioCodec {
     AVCodecID id; ///< For PCM the 16-bit one; the sample size chooses.
     const char* encoder;
     int maxChannels;
-    double minBits; ///< Least bits per sample and channel; 0: no limit.
-    double maxBits; ///< Most bits per sample and channel; 0: no bit rate at all.
+    double minBits;        ///< Least bits per sample and channel; 0: no limit.
+    double maxBits;        ///< Most bits per sample and channel; 0: no bit rate at all.
+    int maxSampleRate = 0; ///< 0: as the encoder tells itself.
 };
 
 /// How a file can be kept playable while it grows, and what a container cannot express.

@@ -134,22 +134,27 @@ TEST(Sound, LateSoundBeginsLate) {
     }
 }
 
-TEST(Sound, BitRatesAreKeptWithinTheCodecsLimits) {
+TEST(Sound, RatesAreKeptWithinTheCodecsLimits) {
     const Folder folder;
     TestMovie movie;
     movie.hasVideo = false;
-    movie.sampleRate = 8000;
     movie.channels = 1;
     for (const auto& [format, codec] : {std::pair{FourCC("M4A "), FourCC("AAC ")},
                                         {FourCC("M4A "), FourCC("mp4a")}, // another name of AAC
                                         {FourCC("MP3 "), FourCC("MP3 ")},
                                         {FourCC("OGG "), FourCC("VORB")},
                                         {FourCC("OGG "), FourCC("OPUS")}}) {
-        for (const int rate : {1, 128'000, 10'000'000}) {
+        for (const auto& [sampleRate, rate] : {std::pair{8000, 1},
+                                               {8000, 128'000},
+                                               {8000, 10'000'000},
+                                               {96'000, 128'000},
+                                               {192'000, 128'000}}) {
+            movie.sampleRate = movie.param.nSampleRate = sampleRate;
             movie.param.fccFileFormat = format;
             movie.param.fccAudio = codec;
             movie.param.nAudioBitrate = rate;
-            EXPECT_TRUE(movie.Write(folder / "movie")) << codec << ' ' << rate << ' ' << Latest().szWhat;
+            EXPECT_TRUE(movie.Write(folder / "movie"))
+                << codec << ' ' << sampleRate << ' ' << rate << ' ' << Latest().szWhat;
             EXPECT_LE(Latest().nAudioBitrate, 400'000);
         }
     }
