@@ -79,10 +79,12 @@ public:
             return 0;
         if (errno != EINVAL && errno != ENOSYS)
             return errno;
-        // File systems without that operation have hard links or nothing.
-        if (link(from.c_str(), to.c_str()) != 0)
+        // File systems without that operation have hard links; where there are none either, looking must do.
+        if (link(from.c_str(), to.c_str()) == 0)
+            return Remove(from);
+        if (errno != EPERM && errno != ENOSYS && errno != EOPNOTSUPP)
             return errno;
-        return Remove(from);
+        return IsMissing(to) ? Rename(from, to, true) : EEXIST;
     }
 
     int Remove(const std::string& path) override { return unlink(path.c_str()) == 0 ? 0 : errno; }
