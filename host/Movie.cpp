@@ -32,7 +32,8 @@ void Movie::Stop() {
 std::vector<std::string> Movie::Complaints() const {
     std::vector<std::string> texts;
     if (const int jumps = demuxer_.ClockJumps(); jumps > 0) {
-        texts.push_back(fmt::format("the source's clock jumped {} times; the parts were joined", jumps));
+        texts.push_back(fmt::format("the source's clock jumped {}; the parts were joined",
+                                    jumps == 1 ? "once" : fmt::format("{} times", jumps)));
     }
     if (pictures_ && pictures_->Damaged() > 0) {
         texts.push_back(fmt::format("{} damaged pieces of picture data were skipped", pictures_->Damaged()));
