@@ -197,6 +197,8 @@ TEST(Program, RefusesAndLeavesEverythingAsItWas) {
         {{source, folder / "clip", "--split", "1", "-f", "mp4"}, 2, "extension"},
         {{source, folder / (std::string(249, 'n') + ".mp4"), "--split", "1"}, 2, "too long"},
         {{source, folder / "out.mp3", "--split", "1"}, 2, "needs pictures"},
+        {{source, folder / "out.mp4", "--split", "0.01"}, 2, "--split takes"},
+        {{source, folder / "out.mp4", "--length", "0"}, 2, "at least 0.001"},
         {{source, folder / "there.mp4/out.mp4"}, 4, "is not a folder"},
         {{"--estimate", source, folder / "nowhere/out.mp4"}, 4, "nowhere"},
         {{source, folder / "nowhere/out.mp4"}, 4, "nowhere"},
@@ -452,7 +454,9 @@ TEST(Program, SaysThatTheDiskIsFullAndKeepsWhatIsDone) {
     EXPECT_GT(LookAt(folder / "disk/" + left[0]).pictures.size(), 25u);
 
     fs::remove(folder / "disk/" + left[0]);
-    EXPECT_EQ(Call(Join(making, Args{"--no-keep-partial"})).code, 5);
+    const Result quiet = Call(Join(making, Args{"--no-keep-partial", "--quiet"}));
+    EXPECT_EQ(quiet.code, 5);
+    EXPECT_EQ(quiet.out, "");
     EXPECT_TRUE(folder.Names("disk").empty());
 }
 
