@@ -61,7 +61,8 @@ bool Demuxer::Seek(double seconds) {
 bool Demuxer::SeekBefore(double seconds) {
     AVFormatContext* context = source_.Context();
     const int64_t start = context->start_time != AV_NOPTS_VALUE ? context->start_time : 0;
-    for (double back = kPreroll; back < seconds; back = 2 * back + 1) {
+    double back = kPreroll;
+    while (back < seconds) {
         const int64_t target = start + std::llround((seconds - back) * AV_TIME_BASE);
         const auto seek = [&] { return avformat_seek_file(context, -1, INT64_MIN, target, target, 0) >= 0; };
         if (!seek()) {
@@ -70,6 +71,7 @@ bool Demuxer::SeekBefore(double seconds) {
         if (KeyPictureAtOrBefore(ToMediaTime(seconds))) {
             return seek();
         }
+        back = 2 * back + 1;
     }
     return false;
 }

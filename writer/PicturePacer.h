@@ -31,8 +31,8 @@ PictureClock MakePictureClock(AVRational rate, bool wholePictures);
 class PicturePacer {
 public:
     /// `keepStamps`: every picture is shown once at its own time, times that lie near the steady grid are put
-    /// on it; where the clock counts whole pictures, those too many are left out. Otherwise the grid is filled
-    /// exactly.
+    /// on it; where the clock counts whole pictures, those too many are left out. Otherwise the grid is
+    /// filled exactly.
     PicturePacer(const PictureClock& clock, bool keepStamps);
 
     /// `count` showings, the first at `tick`, each a picture after the one before; 0: not shown at all.
