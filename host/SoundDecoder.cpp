@@ -124,7 +124,10 @@ void SoundDecoder::DecodeAll() {
     while (goesOn) {
         const av::Packet packet = demuxer_.Take(stream_->index);
         goesOn = decoder_.Decode(packet.get(), accept) && packet;
-        damaged_ = decoder_.Damaged();
+        if (begin_ > 0 && timeline_->Position() == 0) {
+            damagedBefore_ = decoder_.Damaged();
+        }
+        damaged_ = decoder_.Damaged() - damagedBefore_;
     }
     if (resampler_) {
         PushPlaced(std::nullopt, Resample(nullptr));

@@ -61,6 +61,7 @@ private:
     av::ChannelLayout outputLayout_;
     av::Frame inputForm_; // format, rate and layout that the resampler is made for
     std::optional<SoundTimeline> timeline_;
+    int64_t damagedBefore_ = 0; // the begin, where a seek may land amid a frame
 
     // Between the threads.
     BoundedQueue<Chunk> queue_;

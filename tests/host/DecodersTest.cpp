@@ -116,6 +116,14 @@ const SeekCase kSeekCases[] = {
 INSTANTIATE_TEST_SUITE_P(Movies, DecodersSeek, testing::ValuesIn(kSeekCases),
                          [](const auto& test) { return test.param.name; });
 
+TEST(Decoders, DoNotCountTheFrameThatASeekCutsAsDamaged) {
+    Movie movie(Make("counted.mpg", Join(CountedPictures(4), Beeps(4), Args{"-c:v", "mpeg2video"})), {});
+    TakeAll(movie, 1.23);
+    for (const std::string& complaint : movie.Complaints()) {
+        EXPECT_EQ(complaint.find("damaged"), std::string::npos) << complaint;
+    }
+}
+
 TEST(Decoders, KeepTheStampsOfAVariableRate) {
     // Pictures 0, 1, 2, 6, 7, 8, 12 ... of a steady sequence.
     const std::string path =
