@@ -20,6 +20,11 @@ namespace {
 /// rarer.
 constexpr int64_t kFragmentLength = 1'000'000;
 
+/// By how many microseconds one stream may run ahead of another before it is written without it; longer until
+/// each has begun.
+constexpr int64_t kMostApart = 10'000'000;
+constexpr int64_t kMostApartAtFirst = 600'000'000;
+
 bool Has(const AVFormatContext& output, AVCodecID id) {
     return std::any_of(output.streams, output.streams + output.nb_streams,
                        [id](const AVStream* stream) { return stream->codecpar->codec_id == id; });
@@ -139,6 +144,10 @@ void Muxer::Write(AVPacket& packet, int stream) {
     }
     state.lastDts = packet_->dts;
     packet_->stream_index = stream;
+    // What begins before the first packet of the file is refused by some: an encoder may hold many pictures.
+    const bool allBegun =
+        std::all_of(streams_.begin(), streams_.end(), [](const State& each) { return each.begun; });
+    output_->max_interleave_delta = allBegun ? kMostApart : kMostApartAtFirst;
     Check(av_interleaved_write_frame(output_.get(), packet_.get()), "refuses a packet");
     ++state.packets;
 }

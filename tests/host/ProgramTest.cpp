@@ -132,6 +132,8 @@ Args Lossless(double pictureSeconds, double soundSeconds) {
 
 const Args kLateSound = Join(CountedPictures(3), Args{"-itsoffset", "1"}, Beeps(2), kLossless);
 const Args kVariable = Join(CountedPictures(4), Args{"-vf", "select='lt(mod(n,6),3)'", "-fps_mode", "vfr"});
+const Args kStill = Join(CountedPictures(14), Beeps(14), Args{"-vf", "select='lt(n,1)+gt(n,250)'"},
+                         Args{"-fps_mode", "vfr"}, kLossless);
 const Args kSurround = Join(CountedPictures(1), Beeps(1), Args{"-c:v", "mpeg4", "-c:a", "ac3", "-ac", "6"});
 
 // A part has the picture shown at its begin, and those that begin before its end.
@@ -144,6 +146,7 @@ const Odd kOddities[] = {
     {"short-sound.mkv", Lossless(3, 1), "o.mp4", 75, 3},
     {"long-sound.mkv", Lossless(1, 3), "o.mp4", 25, 3},
     {"late-sound.mkv", kLateSound, "o.avi", 75, 3},
+    {"still.mkv", kStill, "o.flv", 100, 14},
     {"variable.mp4", kVariable, "o.avi", 100, 0},
     {"plain.mkv", Lossless(2, 2), "o.mkv", 50, 0, {"--no-audio"}},
     {"plain.mkv", Lossless(2, 2), "o.mp3", 0, 2, {"--no-video"}},
