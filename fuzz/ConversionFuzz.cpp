@@ -264,7 +264,7 @@ private:
     void Picture(int file) {
         FUZZ_CHECK(file == open && loop != Loop::kSound);
         const VideoImage source = video.Picture(pictures);
-        const VideoImage written = recordedPictures.at(pictures++).record;
+        const VideoImage written = recordedPictures.at(pictures++);
         VideoImage moved = source;
         if (loop == Loop::kBoth) {
             moved.llTime = Add(source.llTime, shift);
@@ -278,7 +278,7 @@ private:
 
     void Sound(int file) {
         FUZZ_CHECK(file == open && loop != Loop::kPictures);
-        const AudioFrame written = recordedSounds.at(sounds++).record;
+        const AudioFrame written = recordedSounds.at(sounds++);
         if (written.nType == kMediaTypeSilence)
             Silence(written);
         else
@@ -330,8 +330,8 @@ private:
     const ListedVideo& video;
     const ListedAudio& audio;
     const bool reports;
-    const std::vector<recorder::Written<AudioFrame>> recordedSounds = recorder::Sounds();
-    const std::vector<recorder::Written<VideoImage>> recordedPictures = recorder::Pictures();
+    const std::vector<AudioFrame> recordedSounds = recorder::Sounds();
+    const std::vector<VideoImage> recordedPictures = recorder::Pictures();
     std::string_view rest;
     std::string before;
     Loop loop = Loop::kNone;

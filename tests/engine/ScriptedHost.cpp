@@ -11,10 +11,6 @@ namespace {
 
 std::atomic<uint32_t> g_ticks{0}; // what the engine reads as its clock, 10 ms each
 
-void AdvanceClock(uint32_t ms) {
-    g_ticks += ms / 10;
-}
-
 __attribute__((format(printf, 1, 2))) void Note(const char* format, ...) {
     char line[256];
     va_list arguments;
@@ -62,6 +58,10 @@ std::string Filter(bool logLines) {
 }
 
 } // namespace
+
+void AdvanceClock(uint32_t ms) {
+    g_ticks += ms / 10;
+}
 
 // These two take the place of the system's and the platform's, in the engine too.
 

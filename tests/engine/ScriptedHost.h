@@ -16,6 +16,9 @@
 constexpr int64_t kSecond = 10000000;
 constexpr int64_t kMs = 10000;
 
+/// Moves the clock that the engine reads, for decoders of one's own; steps of 10 ms count.
+void AdvanceClock(uint32_t ms);
+
 /// Plays pictures with the given stamps. Notes
 ///     seek video SECONDS MODE
 ///     image STAMP, or image none
