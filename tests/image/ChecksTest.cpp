@@ -49,8 +49,8 @@ TEST(ChecksDeathTest, BitmapsAndPlanes) {
     };
     for (const auto& row : rows) {
         const std::string bitmap = row.bitmap;
-        const std::string format =
-            bitmap + "Bmi && " + bitmap + "Bmi->biBitCount == " + std::to_string(row.bits);
+        std::string format = bitmap + "Bmi && ";
+        format.append(bitmap).append("Bmi->biBitCount == ").append(std::to_string(row.bits));
         auto* const right = row.bits == 32 ? &header32 : &header24;
         auto* const wrong = row.bits == 32 ? &header24 : &header32;
         ExpectFailedCheck([&] { row.convert(nullptr, kSome, kSome, kSome, kSome); }, row.line, format);
