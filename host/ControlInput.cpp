@@ -24,9 +24,8 @@ namespace {
 sigset_t OurSignals() {
     sigset_t set;
     sigemptyset(&set);
-    for (const int signal : {SIGINT, SIGTERM, SIGHUP, SIGTSTP}) {
+    for (const int signal : {SIGINT, SIGTERM, SIGHUP, SIGTSTP})
         sigaddset(&set, signal);
-    }
     return set;
 }
 
@@ -49,9 +48,8 @@ bool OwnsTerminal() {
 void WriteAll(int descriptor, const std::string& text) {
     for (std::size_t done = 0; done < text.size();) {
         const ssize_t count = write(descriptor, text.data() + done, text.size() - done);
-        if (count < 0 && errno != EINTR) {
+        if (count < 0 && errno != EINTR)
             return;
-        }
         done += count > 0 ? static_cast<std::size_t>(count) : 0;
     }
 }
@@ -61,9 +59,8 @@ void WriteAll(int descriptor, const std::string& text) {
 ControlInput::ControlInput() {
     const sigset_t ours = OurSignals();
     pthread_sigmask(SIG_BLOCK, &ours, nullptr);
-    for (const int failure : {SIGPIPE, SIGXFSZ}) { // the write that fails tells it
+    for (const int failure : {SIGPIPE, SIGXFSZ}) // the write that fails tells it
         std::signal(failure, SIG_IGN);
-    }
     signals_ = signalfd(-1, &ours, SFD_CLOEXEC);
     wake_ = eventfd(0, EFD_CLOEXEC);
     thread_ = std::thread(&ControlInput::Run, this);
@@ -90,39 +87,33 @@ void ControlInput::Arm(bool keys) {
 void ControlInput::Suspend() {
     RestoreTerminal();
     kill(getpid(), SIGSTOP);
-    if (keys_ && OwnsTerminal()) {
+    if (keys_ && OwnsTerminal())
         UseKeyboard();
-    }
 }
 
 void ControlInput::Run() {
     for (;;) {
         std::array<pollfd, 3> sources{pollfd{signals_, POLLIN, 0}, pollfd{wake_, POLLIN, 0},
                                       pollfd{keys_ ? STDIN_FILENO : -1, POLLIN, 0}};
-        if (poll(sources.data(), sources.size(), -1) < 0) {
+        if (poll(sources.data(), sources.size(), -1) < 0)
             continue;
-        }
         if ((sources[1].revents & POLLIN) != 0) {
             eventfd_t count = 0;
             eventfd_read(wake_, &count);
-            if (count >= UINT32_MAX) {
+            if (count >= UINT32_MAX)
                 return;
-            }
         }
-        if ((sources[0].revents & POLLIN) != 0) {
+        if ((sources[0].revents & POLLIN) != 0)
             TakeSignal();
-        }
-        if (sources[2].revents != 0) {
+        if (sources[2].revents != 0)
             TakeKeys();
-        }
     }
 }
 
 void ControlInput::TakeSignal() {
     signalfd_siginfo info{};
-    if (read(signals_, &info, sizeof info) != sizeof info) {
+    if (read(signals_, &info, sizeof info) != sizeof info)
         return;
-    }
     const int signal = static_cast<int>(info.ssi_signo);
     if (signal == SIGTSTP) {
         PostHostEvent(EventKind::kSuspend);
@@ -143,11 +134,10 @@ void ControlInput::TakeKeys() {
     }
     for (ssize_t i = 0; i < count; ++i) {
         const char key = keys[static_cast<std::size_t>(i)];
-        if (key == ' ' || key == 'p' || key == 'P') {
+        if (key == ' ' || key == 'p' || key == 'P')
             PostHostEvent(EventKind::kPauseKey);
-        } else if (key == 'q' || key == 'Q') {
+        else if (key == 'q' || key == 'Q')
             PostHostEvent(EventKind::kStop, 0);
-        }
     }
 }
 
@@ -176,9 +166,8 @@ void ControlInput::LeaveAtOnce(int signal) {
 void ControlInput::UseKeyboard() {
     Terminal& terminal = TheTerminal();
     const std::lock_guard lock(terminal.mutex);
-    if (terminal.changed || tcgetattr(STDIN_FILENO, &terminal.found) != 0) {
+    if (terminal.changed || tcgetattr(STDIN_FILENO, &terminal.found) != 0)
         return;
-    }
     termios settings = terminal.found;
     settings.c_lflag &= ~static_cast<tcflag_t>(ICANON | ECHO);
     settings.c_cc[VMIN] = 1;
@@ -191,9 +180,8 @@ void ControlInput::RestoreTerminal() {
     const std::lock_guard lock(terminal.mutex);
     if (terminal.changed) {
         // In the background this would stop the process; then the shell has put the settings right already.
-        if (OwnsTerminal()) {
+        if (OwnsTerminal())
             tcsetattr(STDIN_FILENO, TCSANOW, &terminal.found);
-        }
         terminal.changed = false;
     }
 }

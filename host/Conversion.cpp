@@ -37,18 +37,15 @@ Converter MakeConverter(const Options& options, Movie& movie) {
     const FileFormatInfo& format = ChooseFormat(options);
     Converter converter(MCCreate(movie.Pictures(), movie.Sound()));
     EncodeParam defaults{};
-    if (!converter || MCGetEncodeParam(converter.get(), &defaults) == 0) {
+    if (!converter || MCGetEncodeParam(converter.get(), &defaults) == 0)
         throw Failure(ExitCode::kInternal, "no memory for the converter");
-    }
     const EncodeParam param = PlanEncoding(defaults, format, options, movie.Info());
     MCSetEncodeParam(converter.get(), &param);
     MCSetOutputFile(converter.get(), text::FromUtf8(options.output).c_str());
-    if (options.split && param.bNoVideo != 0) {
+    if (options.split && param.bNoVideo != 0)
         throw Failure(ExitCode::kUsage, "--split needs pictures: sound alone is written as one file");
-    }
-    if (options.split) {
+    if (options.split)
         MCSetSplitParam(converter.get(), 1, static_cast<unsigned long>(std::lround(*options.split * 1000)));
-    }
     MCEnablePreview(converter.get(), options.preview ? 1 : 0);
     return converter;
 }
@@ -63,12 +60,10 @@ Conversion::Conversion(const Options& options, Movie& movie, Reporter& reporter,
       files_(reporter),
       converter_(MakeConverter(options, movie)),
       clock_(Now()) {
-    if (options.length) {
+    if (options.length)
         movie.EndPicturesAt(options.begin + length_);
-    }
-    if (options.preview) {
+    if (options.preview)
         preview_.emplace(*options.preview);
-    }
 }
 
 ExitCode Conversion::Run() {
@@ -77,12 +72,10 @@ ExitCode Conversion::Run() {
     control_.Arm(options_.progress == ProgressStyle::kBar && !options_.quiet);
     clock_.Skip(Now());
     if (MCStart(converter_.get(), options_.begin, options_.length.value_or(0), nullptr, OnProgress, this) !=
-        0) {
+        0)
         throw Failure(ExitCode::kInternal, "the conversion could not be started");
-    }
-    if (MCWait(converter_.get(), 0) == 0 && outcome_ == kNone) {
+    if (MCWait(converter_.get(), 0) == 0 && outcome_ == kNone)
         throw Failure(ExitCode::kInternal, "no thread could be started for the conversion");
-    }
     try {
         WaitForEnd();
     } catch (...) {
@@ -109,9 +102,8 @@ unsigned Conversion::OnProgress(void* context, unsigned kind, unsigned value, ui
     auto* conversion = static_cast<Conversion*>(context);
     if (const auto* progress = reinterpret_cast<const ProgressInfo*>(info)) {
         conversion->position_ = progress->dPosition;
-        if (conversion->preview_ && progress->pPreviewImage != nullptr) {
+        if (conversion->preview_ && progress->pPreviewImage != nullptr)
             conversion->preview_->Offer(*progress->pPreviewImage);
-        }
     }
     if (kind == 1) {
         conversion->outcome_ = static_cast<int>(value);
@@ -125,28 +117,23 @@ void Conversion::WaitForEnd() {
         Event event{};
         const bool received = ReceiveHostEvent(paused_ ? -1 : kTickSeconds, event);
         UpdateClock();
-        if (received) {
+        if (received)
             Handle(event);
-        }
-        if (outcome_ == kNone && WriterWatch::FileVanished()) {
+        if (outcome_ == kNone && WriterWatch::FileVanished())
             Stop(); // whatever else were converted would be lost
-        }
-        if (outcome_ == kNone) {
+        if (outcome_ == kNone)
             ReportProgress();
-        }
     }
 }
 
 void Conversion::UpdateClock() {
     const WorkClock::Time now = Now();
-    if (now - clock_.Last() > kSuspicious) {
+    if (now - clock_.Last() > kSuspicious)
         clock_.Skip(now);
-    }
-    if (paused_ || watch_.WaitsForRoom()) {
+    if (paused_ || watch_.WaitsForRoom())
         clock_.Stand(now);
-    } else {
+    else
         clock_.Go(now);
-    }
 }
 
 void Conversion::Handle(const Event& event) {
@@ -171,11 +158,9 @@ void Conversion::Handle(const Event& event) {
 }
 
 void Conversion::TakeNews() {
-    while (const auto news = watch_.Take()) {
-        if (!files_.Enter(*news)) {
+    while (const auto news = watch_.Take())
+        if (!files_.Enter(*news))
             Stop();
-        }
-    }
 }
 
 /// Ends the conversion; what was written so far is finished as a file.
@@ -243,9 +228,8 @@ void Conversion::ReportProgress() {
 ExitCode Conversion::Conclude() {
     TakeNews();
     if (preview_) {
-        if (const std::string failure = preview_->Finish(); !failure.empty()) {
+        if (const std::string failure = preview_->Finish(); !failure.empty())
             reporter_.Warning(failure);
-        }
     }
     ReportComplaints();
     EndReport end{};
@@ -273,21 +257,18 @@ ExitCode Conversion::Conclude() {
 
 /// What went wrong, by the writer's word, the engine's and the source's.
 std::optional<Failure> Conversion::Verdict() {
-    if (files_.FirstFailure()) {
+    if (files_.FirstFailure())
         return files_.FirstFailure();
-    }
     std::string reason = movie_.ReadError();
     if (files_.Complete() == 0) { // the writer keeps no empty file
-        if (userStopped_ && reason.empty()) {
+        if (userStopped_ && reason.empty())
             return std::nullopt;
-        }
         return Failure(ExitCode::kCannotRead,
                        reason.empty() ? fmt::format("\"{}\" holds nothing to convert", options_.input)
                                       : fmt::format("cannot read \"{}\": {}", options_.input, reason));
     }
-    if (reason.empty() && EndedEarly() && HasShrunk(movie_.Info())) {
+    if (reason.empty() && EndedEarly() && HasShrunk(movie_.Info()))
         reason = "the file was cut meanwhile";
-    }
     if (!reason.empty() && !userStopped_) {
         return Failure(ExitCode::kCannotRead,
                        fmt::format("reading \"{}\" failed after {}: {}; what was read is converted",
@@ -302,9 +283,8 @@ bool Conversion::EndedEarly() const {
 }
 
 void Conversion::ReportComplaints() {
-    for (const std::string& complaint : movie_.Complaints()) {
+    for (const std::string& complaint : movie_.Complaints())
         reporter_.Warning(fmt::format("\"{}\": {}", options_.input, complaint));
-    }
     if (EndedEarly()) {
         reporter_.Warning(fmt::format("\"{}\" ended after {} although it announces {}", options_.input,
                                       FormatTime(options_.begin + position_, true),

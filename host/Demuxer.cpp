@@ -31,26 +31,22 @@ void Describe(const std::exception& error, std::string& reason) noexcept {
 } // namespace
 
 Demuxer::Demuxer(Source& source) : source_(source) {
-    if (const AVStream* pictures = source.PictureStream()) {
+    if (const AVStream* pictures = source.PictureStream())
         queues_[pictures->index];
-    }
-    if (const AVStream* sound = source.SoundStream()) {
+    if (const AVStream* sound = source.SoundStream())
         queues_[sound->index];
-    }
 }
 
 Demuxer::~Demuxer() {
     Stop();
-    if (thread_.joinable()) {
+    if (thread_.joinable())
         thread_.join();
-    }
 }
 
 bool Demuxer::Seek(double seconds) {
     const std::lock_guard lock(mutex_);
-    if (started_ || seconds == soughtSeconds_) {
+    if (started_ || seconds == soughtSeconds_)
         return soughtWell_ && seconds == soughtSeconds_;
-    }
     soughtSeconds_ = seconds;
     soughtWell_ = source_.IsSeekable() && (SeekBefore(seconds) || source_.Rewind());
     return soughtWell_;
@@ -65,12 +61,10 @@ bool Demuxer::SeekBefore(double seconds) {
     while (back < seconds) {
         const int64_t target = start + std::llround((seconds - back) * AV_TIME_BASE);
         const auto seek = [&] { return avformat_seek_file(context, -1, INT64_MIN, target, target, 0) >= 0; };
-        if (!seek()) {
+        if (!seek())
             return false;
-        }
-        if (KeyPictureAtOrBefore(ToMediaTime(seconds))) {
+        if (KeyPictureAtOrBefore(ToMediaTime(seconds)))
             return seek();
-        }
         back = 2 * back + 1;
     }
     return false;
@@ -80,17 +74,15 @@ bool Demuxer::SeekBefore(double seconds) {
 /// stream.
 bool Demuxer::KeyPictureAtOrBefore(int64_t mediaTime) {
     const AVStream* pictures = source_.PictureStream();
-    if (pictures == nullptr) {
+    if (pictures == nullptr)
         return true;
-    }
     const av::Packet packet = av::NewPacket();
     for (int i = 0; i < kProbedPackets && av_read_frame(source_.Context(), packet.get()) >= 0; ++i) {
         const bool isKey = packet->stream_index == pictures->index && (packet->flags & AV_PKT_FLAG_KEY) != 0;
         const int64_t stamp = packet->pts != AV_NOPTS_VALUE ? packet->pts : packet->dts;
         av_packet_unref(packet.get());
-        if (isKey) {
+        if (isKey)
             return stamp == AV_NOPTS_VALUE || source_.MediaTime(stamp, pictures) <= mediaTime;
-        }
     }
     return false;
 }
@@ -109,17 +101,15 @@ av::Packet Demuxer::Take(int stream) {
     WaitAndTell(
         changed_, lock, [&] { return stopping_ || ended_ || !queue.packets.empty(); },
         L"Movie::A decoder waits for the source");
-    if (stopping_ || queue.packets.empty()) {
+    if (stopping_ || queue.packets.empty())
         return nullptr;
-    }
     av::Packet packet = std::move(queue.packets.front());
     queue.packets.pop_front();
     queue.bytes -= static_cast<std::size_t>(packet->size);
     const bool wanted = !Holds(kEnoughPackets / 2, kEnoughBytes / 2); // waking it for each packet costs more
     lock.unlock();
-    if (wanted) {
+    if (wanted)
         changed_.notify_all();
-    }
     return packet;
 }
 
@@ -142,9 +132,8 @@ void Demuxer::Fail(const std::exception_ptr& failure) noexcept {
     }
     {
         const std::lock_guard lock(mutex_);
-        if (readError_.empty()) {
+        if (readError_.empty())
             readError_ = std::move(reason);
-        }
     }
     Stop();
 }
@@ -164,9 +153,8 @@ bool Demuxer::Holds(std::size_t packets, std::size_t bytes) const {
     std::size_t held = 0;
     bool allFilled = true;
     for (const auto& [stream, queue] : queues_) {
-        if (queue.packets.empty()) {
+        if (queue.packets.empty())
             return false;
-        }
         held += queue.bytes;
         allFilled = allFilled && queue.packets.size() >= packets;
     }
@@ -199,21 +187,18 @@ bool Demuxer::ReadOne() {
     av::Packet packet = av::NewPacket();
     const int result = av_read_frame(source_.Context(), packet.get());
     av::CheckMemory(result);
-    if (result == AVERROR(EAGAIN) || (result == AVERROR_INVALIDDATA && ++failedReads_ < kToleratedFailures)) {
+    if (result == AVERROR(EAGAIN) || (result == AVERROR_INVALIDDATA && ++failedReads_ < kToleratedFailures))
         return true;
-    }
     if (result < 0) {
         const std::lock_guard lock(mutex_);
-        if (result != AVERROR_EOF && !stopping_) {
+        if (result != AVERROR_EOF && !stopping_)
             readError_ = av::ErrorText(result);
-        }
         return false;
     }
     failedReads_ = 0;
     const auto found = queues_.find(packet->stream_index);
-    if (found == queues_.end()) {
+    if (found == queues_.end())
         return true;
-    }
     RepairClock(*packet);
     {
         const std::lock_guard lock(mutex_);
@@ -227,9 +212,8 @@ bool Demuxer::ReadOne() {
 /// Recordings joined end to end start a new clock in the middle. From there on the stamps of all streams are
 /// shifted so that time goes on where it stopped.
 void Demuxer::RepairClock(AVPacket& packet) {
-    if ((source_.Context()->iformat->flags & AVFMT_TS_DISCONT) == 0 || packet.dts == AV_NOPTS_VALUE) {
+    if ((source_.Context()->iformat->flags & AVFMT_TS_DISCONT) == 0 || packet.dts == AV_NOPTS_VALUE)
         return;
-    }
     const AVStream* stream = source_.Context()->streams[packet.stream_index];
     const AVRational mediaBase{1, kMediaSecond};
     const int64_t stamp = av_rescale_q(packet.dts, stream->time_base, mediaBase);
@@ -238,9 +222,8 @@ void Demuxer::RepairClock(AVPacket& packet) {
     if (due != due_.end()) {
         const auto ahead = [&](int64_t candidate) { return stamp + candidate - due->second; };
         // Where the clock changes, the last packets of one stream can come after the first ones of the other.
-        if (std::abs(ahead(earlierShift_)) < std::abs(ahead(shift))) {
+        if (std::abs(ahead(earlierShift_)) < std::abs(ahead(shift)))
             shift = earlierShift_;
-        }
         if (ahead(shift) > kLargestStep || ahead(shift) < -kLargestFall) {
             earlierShift_ = clockShift_;
             shift = clockShift_ = due->second - stamp;
@@ -253,9 +236,8 @@ void Demuxer::RepairClock(AVPacket& packet) {
     due_[packet.stream_index] = stamp + shift + step;
     const int64_t ticks = av_rescale_q(shift, mediaBase, stream->time_base);
     packet.dts += ticks;
-    if (packet.pts != AV_NOPTS_VALUE) {
+    if (packet.pts != AV_NOPTS_VALUE)
         packet.pts += ticks;
-    }
 }
 
 } // namespace host

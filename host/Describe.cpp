@@ -11,9 +11,8 @@ std::string DescribePictures(const PictureStreamInfo& pictures) {
     std::string text = fmt::format("pictures:  {}, {} x {}, {:.3f} a second, {}, {}", pictures.codec,
                                    pictures.width, pictures.height, pictures.frameRate, pictures.pixelFormat,
                                    FormatTime(pictures.duration, true));
-    if (pictures.pixelAspect.num != pictures.pixelAspect.den) {
+    if (pictures.pixelAspect.num != pictures.pixelAspect.den)
         text += fmt::format(", pixels {}:{}", pictures.pixelAspect.num, pictures.pixelAspect.den);
-    }
     if (pictures.quarterTurns != 0 || pictures.mirrored) {
         text += fmt::format(", {}turned by {} degrees", pictures.mirrored ? "mirrored, " : "",
                             pictures.quarterTurns * 90);

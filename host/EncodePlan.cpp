@@ -27,9 +27,8 @@ uint32_t CodecCode(const std::string& text, const char* option) {
 template <std::size_t N>
 uint32_t ChooseCodec(const std::optional<std::string>& asked, const char* option, uint32_t usual,
                      const uint32_t (&carried)[N]) {
-    if (asked) {
+    if (asked)
         return CodecCode(*asked, option);
-    }
     const bool carriesUsual = std::find(std::begin(carried), std::end(carried), usual) != std::end(carried);
     return carriesUsual || carried[0] == 0 ? usual : carried[0];
 }
@@ -62,11 +61,10 @@ EncodeParam PlanEncoding(const EncodeParam& defaults, const FileFormatInfo& form
         param.nHeight = options.size->height;
     }
     param.bResize = options.fit == Fit::kStretch ? 1 : 0;
-    if (options.frameRate) { // no reference to the record's double, which lies on a 4-byte boundary
+    if (options.frameRate) // no reference to the record's double, which lies on a 4-byte boundary
         param.dFrameRate = *options.frameRate;
-    } else if (source.pictures && format.fccFormat == kSteadyRateFormat) {
+    else if (source.pictures && format.fccFormat == kSteadyRateFormat)
         param.dFrameRate = source.pictures->peakRate;
-    }
     param.nVideoBitrate = options.videoRate.value_or(param.nVideoBitrate);
     param.nVideoMaxBitrate = options.videoMaxRate.value_or(0);
     param.nVideoRateMode = options.videoMaxRate ? 1 : 0;
@@ -75,9 +73,8 @@ EncodeParam PlanEncoding(const EncodeParam& defaults, const FileFormatInfo& form
     param.nAudioBitrate = options.audioRate.value_or(param.nAudioBitrate);
     param.nAudioMaxBitrate = options.audioMaxRate.value_or(0);
     param.nAudioRateMode = options.audioMaxRate ? 1 : 0;
-    if (source.sound) {
+    if (source.sound)
         param.nBitsPerSample = source.sound->bitsPerSample;
-    }
     param.bNoVideo = source.pictures && format.bHasVideo != 0 ? 0 : 1;
     param.bNoAudio = source.sound && format.bHasAudio != 0 ? 0 : 1;
     if (param.bNoVideo != 0 && param.bNoAudio != 0) {
@@ -95,9 +92,8 @@ double LengthToConvert(const Options& options, const SourceInfo& source) {
                       fmt::format("--begin is not before the end of \"{}\", which is {:.3f} s long",
                                   source.path, source.duration));
     }
-    if (!options.length) {
+    if (!options.length)
         return rest;
-    }
     return source.durationKnown ? std::min(*options.length, rest) : *options.length;
 }
 

@@ -33,13 +33,11 @@ std::string TextOf(const WriterStatus& failure) {
     std::string text =
         fmt::format("cannot write \"{}\": {}", failure.szPath,
                     failure.szWhat[0] != '\0' ? failure.szWhat : "the media writer gave no reason");
-    if (text.back() == '.') { // the writer's sentence goes on below
+    if (text.back() == '.') // the writer's sentence goes on below
         text.pop_back();
-    }
     if (failure.nSystemError != 0 &&
-        std::strstr(failure.szWhat, std::strerror(failure.nSystemError)) == nullptr) {
+        std::strstr(failure.szWhat, std::strerror(failure.nSystemError)) == nullptr)
         text += fmt::format(" ({})", std::strerror(failure.nSystemError));
-    }
     if (failure.nError == kWriterErrorNoSpace) {
         const int64_t free = FreeBytes(FolderOf(failure.szPath));
         text += fmt::format("; {} were written, {} are free: make room or choose another disk",
@@ -47,18 +45,16 @@ std::string TextOf(const WriterStatus& failure) {
     } else if (failure.nError == kWriterErrorCodec || failure.nError == kWriterErrorFormat) {
         text += "; see \"movieconv --list-formats\"";
     }
-    if (failure.szTemporaryPath[0] != '\0') {
+    if (failure.szTemporaryPath[0] != '\0')
         text += fmt::format("; what was written so far is in \"{}\"", failure.szTemporaryPath);
-    }
     return text;
 }
 
 /// Compares a complete file with what was sent into it. Empty when everything is there.
 std::string MissingFrom(const WriterStatus& file) {
     const auto compare = [&](const char* what, double written, double received) {
-        if (std::abs(written - received) <= kLengthTolerance) {
+        if (std::abs(written - received) <= kLengthTolerance)
             return std::string();
-        }
         return fmt::format("\"{}\" holds {:.3f} s of {}, but {:.3f} s were sent into it", file.szPath,
                            written, what, received);
     };
@@ -86,22 +82,19 @@ bool FileLedger::Enter(const WriterWatch::News& news) {
     default:
         break;
     }
-    if (news.status.nError != kWriterErrorNone && wasWell && !failure_) {
+    if (news.status.nError != kWriterErrorNone && wasWell && !failure_)
         failure_.emplace(CodeOf(news.status), TextOf(news.status));
-    }
     return !(wasWell && failure_);
 }
 
 void FileLedger::EnterClosed(const WriterStatus& file) {
-    if (file.nState != kWriterFileComplete) {
+    if (file.nState != kWriterFileComplete)
         return;
-    }
     ++complete_;
     bytes_ += file.llBytesWritten;
     reporter_.FileClosed({opened_, file.szPath, file.dVideoWritten, file.dAudioWritten, file.llBytesWritten});
-    if (const std::string missing = MissingFrom(file); !missing.empty() && !failure_) {
+    if (const std::string missing = MissingFrom(file); !missing.empty() && !failure_)
         failure_.emplace(ExitCode::kInternal, missing);
-    }
 }
 
 } // namespace host

@@ -53,9 +53,8 @@ bool ReceiveHostEvent(double seconds, Event& event) {
     while (ReceiveNextEvent(0, nullptr, seconds, 1, &received) == noErr) {
         const bool known = Translate(received, event);
         ReleaseEvent(received);
-        if (known) {
+        if (known)
             return true;
-        }
     }
     return false;
 }

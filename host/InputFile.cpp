@@ -41,9 +41,8 @@ InputFile::InputFile(const std::string& path)
 }
 
 InputFile::Descriptor::Descriptor(int number) : number_(number) {
-    if (number_ < 0) {
+    if (number_ < 0)
         throw std::system_error(errno, std::generic_category());
-    }
 }
 
 InputFile::Descriptor::~Descriptor() {
@@ -59,23 +58,19 @@ int InputFile::Read(uint8_t* data, int size) const {
     for (;;) {
         std::array<pollfd, 2> sources{pollfd{file_.Number(), POLLIN, 0}, pollfd{wake_.Number(), POLLIN, 0}};
         const bool waited = poll(sources.data(), sources.size(), -1) >= 0;
-        if (interrupted_) {
+        if (interrupted_)
             return AVERROR_EXIT;
-        }
         const ssize_t count = waited ? read(file_.Number(), data, static_cast<std::size_t>(size)) : -1;
-        if (count >= 0) {
+        if (count >= 0)
             return count == 0 ? AVERROR_EOF : static_cast<int>(count);
-        }
-        if (errno != EINTR) {
+        if (errno != EINTR)
             return AVERROR(errno);
-        }
     }
 }
 
 int64_t InputFile::Seek(int64_t offset, int whence) const {
-    if (whence == AVSEEK_SIZE) {
+    if (whence == AVSEEK_SIZE)
         return size_;
-    }
     const off_t position = lseek(file_.Number(), offset, whence & ~AVSEEK_FORCE);
     return position < 0 ? AVERROR(errno) : position;
 }

@@ -33,11 +33,9 @@ std::string_view PhaseName(Phase phase) {
 
 std::string JsonString(std::string_view bytes) {
     std::wstring wide = text::FromUtf8(bytes);
-    for (wchar_t& character : wide) {
-        if (character >= 0xDC80 && character <= 0xDCFF) {
+    for (wchar_t& character : wide)
+        if (character >= 0xDC80 && character <= 0xDCFF)
             character = 0xFFFD;
-        }
-    }
     std::string quoted = "\"";
     for (const char c : text::ToUtf8(wide)) {
         if (c == '"' || c == '\\') {
@@ -64,9 +62,8 @@ void JsonReporter::Start(const StartReport& report) {
 }
 
 void JsonReporter::Progress(const ProgressReport& report, bool milestone) {
-    if (!milestone && report.worked < nextAt_) {
+    if (!milestone && report.worked < nextAt_)
         return;
-    }
     nextAt_ = report.worked + kInterval;
     Print("progress",
           fmt::format("\"phase\":\"{}\",\"percent\":{},\"position_s\":{},\"speed\":{},\"left_s\":{},"

@@ -17,9 +17,8 @@ CLI::Option* AddParsed(CLI::App& app, const std::string& names,
                        const std::string& notation, const std::string& help) {
     const auto take = [parse, &target, notation, names](const std::string& text) {
         const std::optional<Value> value = parse(text);
-        if (!value) {
+        if (!value)
             throw CLI::ValidationError(names, fmt::format("\"{}\" is not {}", text, notation));
-        }
         target = *value;
     };
     return app.add_option_function<std::string>(names, take, help);
@@ -29,14 +28,12 @@ template <class Value>
 CLI::Option* AddChoice(CLI::App& app, const std::string& name, Value& target,
                        const std::map<std::string, Value>& choices, const std::string& help) {
     std::string list;
-    for (const auto& [word, value] : choices) {
+    for (const auto& [word, value] : choices)
         list += (list.empty() ? "" : "|") + word;
-    }
     const auto take = [name, &target, choices, list](const std::string& text) {
         const auto choice = choices.find(text);
-        if (choice == choices.end()) {
+        if (choice == choices.end())
             throw CLI::ValidationError(name, fmt::format("\"{}\" is not {}", text, list));
-        }
         target = choice->second;
     };
     return app.add_option_function<std::string>(name, take, help)->type_name(list);
@@ -170,21 +167,16 @@ public:
 void RequireNames(const Options& options) {
     const bool needsInput = options.task != Task::kListFormats;
     const bool needsOutput = options.task == Task::kConvert || options.task == Task::kEstimate;
-    if (needsInput && options.input.empty()) {
+    if (needsInput && options.input.empty())
         throw Failure(ExitCode::kUsage, "INPUT is missing; try \"movieconv --help\"");
-    }
-    if (needsOutput && options.output.empty()) {
+    if (needsOutput && options.output.empty())
         throw Failure(ExitCode::kUsage, "OUTPUT is missing; try \"movieconv --help\"");
-    }
-    if (options.noVideo && options.noAudio) {
+    if (options.noVideo && options.noAudio)
         throw Failure(ExitCode::kUsage, "--no-video and --no-audio together leave nothing to convert");
-    }
-    if (options.length && *options.length < 0.001) {
+    if (options.length && *options.length < 0.001)
         throw Failure(ExitCode::kUsage, "--length must be at least 0.001 seconds");
-    }
-    if (options.split && (*options.split < 0.1 || *options.split > 2'000'000)) {
+    if (options.split && (*options.split < 0.1 || *options.split > 2'000'000))
         throw Failure(ExitCode::kUsage, "--split takes from 0.1 to 2000000 seconds");
-    }
 }
 
 } // namespace

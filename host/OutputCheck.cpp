@@ -32,16 +32,14 @@ bool SameFile(const struct stat& a, const struct stat& b) {
 /// Refuses a file that the conversion would replace.
 void CheckTarget(const std::string& path, const struct stat* input, const Options& options) {
     struct stat target {};
-    if (stat(path.c_str(), &target) != 0) {
+    if (stat(path.c_str(), &target) != 0)
         return;
-    }
     if (input != nullptr && SameFile(*input, target)) {
         throw Failure(ExitCode::kUsage,
                       fmt::format("\"{}\" is the source itself; give the output another name", path));
     }
-    if (S_ISDIR(target.st_mode)) {
+    if (S_ISDIR(target.st_mode))
         throw Failure(ExitCode::kCannotWrite, fmt::format("\"{}\" is a folder; name a file in it", path));
-    }
     if (!S_ISREG(target.st_mode)) {
         throw Failure(ExitCode::kCannotWrite,
                       fmt::format("\"{}\" is not a file but a device or a pipe; name a file", path));
@@ -58,9 +56,8 @@ void CheckFolder(const std::string& folder) {
         throw Failure(ExitCode::kCannotWrite, fmt::format("the output's folder \"{}\" cannot be used: {}",
                                                           folder, std::strerror(errno)));
     }
-    if (!S_ISDIR(status.st_mode)) {
+    if (!S_ISDIR(status.st_mode))
         throw Failure(ExitCode::kCannotWrite, fmt::format("\"{}\" is not a folder", folder));
-    }
     if (access(folder.c_str(), W_OK | X_OK) != 0) {
         throw Failure(ExitCode::kCannotWrite,
                       fmt::format("cannot create files in \"{}\": {}; choose another folder", folder,
@@ -72,9 +69,8 @@ void CheckFolder(const std::string& folder) {
 bool IsClipName(std::string_view name, std::string_view base, std::string_view extension) {
     const std::size_t frame = base.size() + 1 + extension.size();
     if (name.size() < frame + 2 || name.substr(0, base.size()) != base || name[base.size()] != '_' ||
-        name.substr(name.size() - extension.size()) != extension) {
+        name.substr(name.size() - extension.size()) != extension)
         return false;
-    }
     const std::string_view number = name.substr(base.size() + 1, name.size() - frame);
     return std::all_of(number.begin(), number.end(), [](char c) { return c >= '0' && c <= '9'; });
 }
@@ -99,28 +95,24 @@ void CheckClips(const Options& options, const struct stat* input) {
     }
     const std::string folder = FolderOf(options.output);
     const std::unique_ptr<DIR, int (*)(DIR*)> listing(opendir(folder.c_str()), closedir);
-    while (const dirent* entry = listing ? readdir(listing.get()) : nullptr) {
-        if (IsClipName(entry->d_name, base, extension)) {
+    while (const dirent* entry = listing ? readdir(listing.get()) : nullptr)
+        if (IsClipName(entry->d_name, base, extension))
             CheckTarget(folder + "/" + entry->d_name, input, options);
-        }
-    }
 }
 
 } // namespace
 
 std::string FolderOf(const std::string& path) {
     const std::size_t slash = path.rfind('/');
-    if (slash == std::string::npos) {
+    if (slash == std::string::npos)
         return ".";
-    }
     return slash == 0 ? "/" : path.substr(0, slash);
 }
 
 int64_t FreeBytes(const std::string& folder) {
     struct statvfs status {};
-    if (statvfs(folder.c_str(), &status) != 0 || status.f_blocks == 0) {
+    if (statvfs(folder.c_str(), &status) != 0 || status.f_blocks == 0)
         return -1;
-    }
     return static_cast<int64_t>(status.f_bavail) * static_cast<int64_t>(status.f_frsize);
 }
 
@@ -128,11 +120,10 @@ void CheckOutput(const Options& options) {
     struct stat inputStatus {};
     const struct stat* input = stat(options.input.c_str(), &inputStatus) == 0 ? &inputStatus : nullptr;
     CheckFolder(FolderOf(options.output));
-    if (options.split) {
+    if (options.split)
         CheckClips(options, input);
-    } else {
+    else
         CheckTarget(options.output, input, options);
-    }
 }
 
 } // namespace host

@@ -13,9 +13,8 @@ av::Frame NewPicture(int width, int height) {
     picture->width = width;
     picture->height = height;
     picture->color_range = AVCOL_RANGE_MPEG;
-    if (av_frame_get_buffer(picture.get(), 0) < 0) {
+    if (av_frame_get_buffer(picture.get(), 0) < 0)
         throw std::bad_alloc();
-    }
     return picture;
 }
 
@@ -51,9 +50,8 @@ void CopyPlane(const Walk& walk, uint8_t* target, ptrdiff_t pitch, int width, in
             for (int y = top; y < height && y < top + kBlock; ++y) {
                 const uint8_t* source = walk.origin + walk.stepY * y + walk.stepX * left;
                 uint8_t* row = target + pitch * y;
-                for (int x = left; x < width && x < left + kBlock; ++x, source += walk.stepX) {
+                for (int x = left; x < width && x < left + kBlock; ++x, source += walk.stepX)
                     row[x] = *source;
-                }
             }
         }
     }
@@ -79,9 +77,8 @@ av::Frame PictureConverter::Scale(const AVFrame& picture) {
                                        picture.width, picture.height, AV_PIX_FMT_YUV420P,
                                        SWS_BICUBIC | SWS_ACCURATE_RND, nullptr, nullptr, nullptr));
     av::Frame converted = NewPicture(picture.width, picture.height);
-    if (!scaler_) {
+    if (!scaler_)
         return nullptr;
-    }
     const int* coefficients = sws_getCoefficients(picture.colorspace);
     sws_setColorspaceDetails(scaler_.get(), coefficients, IsFullRange(picture) ? 1 : 0, coefficients, 0, 0,
                              1 << 16, 1 << 16);

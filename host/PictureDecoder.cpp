@@ -39,9 +39,8 @@ PictureDecoder::PictureDecoder(const Source& source, Demuxer& demuxer)
 PictureDecoder::~PictureDecoder() {
     Stop();
     demuxer_.Stop();
-    if (thread_.joinable()) {
+    if (thread_.joinable())
         thread_.join();
-    }
 }
 
 double PictureDecoder::Seek(double seconds, int /*mode*/) {
@@ -72,9 +71,8 @@ int PictureDecoder::DecodeNext(int /*mode*/) {
 /// Makes the next picture the current one; the last one stays when there is none.
 bool PictureDecoder::Advance() {
     std::optional<Picture> next = queue_.Pop();
-    if (!next) {
+    if (!next)
         return false;
-    }
     current_ = std::move(*next);
     const AVFrame& frame = *current_.frame;
     image_ = {};
@@ -97,9 +95,8 @@ bool PictureDecoder::Advance() {
 void PictureDecoder::Run() {
     demuxer_.Attempt([this] {
         DecodeAll();
-        if (const auto last = stamps_.Finish(); last && held_) {
+        if (const auto last = stamps_.Finish(); last && held_)
             Deliver(*last);
-        }
     });
     repaired_ = stamps_.Repaired();
     damaged_ = damagedBefore_ + decoder_->Damaged();
@@ -109,9 +106,8 @@ void PictureDecoder::Run() {
 void PictureDecoder::DecodeAll() {
     const auto accept = [this](AVFrame& frame) { return Accept(frame); };
     while (const av::Packet packet = demuxer_.Take(stream_->index)) {
-        if (!decoder_->Decode(packet.get(), accept)) {
+        if (!decoder_->Decode(packet.get(), accept))
             return;
-        }
         damaged_ = damagedBefore_ + decoder_->Damaged();
         ConsiderMoreThreads(av::Packet(trial_ ? av_packet_clone(packet.get()) : nullptr));
     }
@@ -125,9 +121,8 @@ bool PictureDecoder::Accept(AVFrame& frame) {
     }
     ++decoded_;
     std::optional<int64_t> stamp;
-    if (frame.best_effort_timestamp != AV_NOPTS_VALUE) {
+    if (frame.best_effort_timestamp != AV_NOPTS_VALUE)
         stamp = source_.MediaTime(frame.best_effort_timestamp, stream_);
-    }
     const auto previous = stamps_.Push(stamp);
     if (previous && !Deliver(*previous)) {
         held_.reset();
@@ -141,12 +136,10 @@ bool PictureDecoder::Accept(AVFrame& frame) {
 /// Hands the held picture on, unless it is over before the conversion begins. False when that ends before it,
 /// or nobody takes it any more.
 bool PictureDecoder::Deliver(StampRepair::Stamp stamp) {
-    if (end_ && stamp.time >= *end_) {
+    if (end_ && stamp.time >= *end_)
         return false;
-    }
-    if (begin_ && stamp.time + stamp.duration <= *begin_) {
+    if (begin_ && stamp.time + stamp.duration <= *begin_)
         return true;
-    }
     if (const int64_t begin = begin_.value_or(0); first_ && (begin_ || stamp.time > begin)) {
         stamp.duration += stamp.time - begin;
         stamp.time = begin;
@@ -157,11 +150,10 @@ bool PictureDecoder::Deliver(StampRepair::Stamp stamp) {
         return true;
     }
     first_ = false;
-    if (++pushed_ == kWarmUpPictures) {
+    if (++pushed_ == kWarmUpPictures)
         use_ = {};
-    } else if (pushed_ > kWarmUpPictures && queue_.Size() == 0) {
+    else if (pushed_ > kWarmUpPictures && queue_.Size() == 0)
         ++starved_;
-    }
     const std::size_t bytes = Bytes(*picture);
     return queue_.Push({std::move(picture), stamp}, bytes);
 }
@@ -170,22 +162,19 @@ bool PictureDecoder::Deliver(StampRepair::Stamp stamp) {
 /// When the queue keeps running empty, the decoder is the slower one and gets the other processors too, if
 /// the program leaves them idle.
 void PictureDecoder::ConsiderMoreThreads(av::Packet packet) {
-    if (!trial_) {
+    if (!trial_)
         return;
-    }
     if (!packet) { // no memory for its copy: the decoder stays as it is
         trial_.reset();
         return;
     }
     trial_->push_back(std::move(packet));
     const int judged = pushed_ - kWarmUpPictures;
-    if (judged < kTrialPictures && trial_->size() < kTrialPackets) {
+    if (judged < kTrialPictures && trial_->size() < kTrialPackets)
         return;
-    }
     const bool runsEmpty = judged <= 0 || starved_ * 2 > judged;
-    if (runsEmpty && use_.Processors() < kBusy * std::thread::hardware_concurrency()) {
+    if (runsEmpty && use_.Processors() < kBusy * std::thread::hardware_concurrency())
         UseMoreThreads();
-    }
     trial_.reset();
 }
 
@@ -195,11 +184,9 @@ void PictureDecoder::UseMoreThreads() {
     damagedBefore_ += decoder_->Damaged();
     decoder_ = std::make_unique<StreamDecoder>(*stream_, threads_);
     skip_ = decoded_;
-    for (const av::Packet& packet : *trial_) {
-        if (!decoder_->Decode(packet.get(), [this](AVFrame& frame) { return Accept(frame); })) {
+    for (const av::Packet& packet : *trial_)
+        if (!decoder_->Decode(packet.get(), [this](AVFrame& frame) { return Accept(frame); }))
             return;
-        }
-    }
 }
 
 } // namespace host

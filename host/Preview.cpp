@@ -35,9 +35,8 @@ av::Frame ToRgb(const std::vector<uint8_t>& bgra, int width, int height) {
     frame->format = AV_PIX_FMT_RGB24;
     frame->width = width;
     frame->height = height;
-    if (av_frame_get_buffer(frame.get(), 0) < 0) {
+    if (av_frame_get_buffer(frame.get(), 0) < 0)
         return nullptr;
-    }
     const uint8_t* source = bgra.data();
     for (int y = 0; y < height; ++y) {
         uint8_t* target = frame->data[0] + static_cast<ptrdiff_t>(y) * frame->linesize[0];
@@ -54,9 +53,8 @@ av::Packet EncodePng(const AVFrame& frame) {
     const AVCodec* codec = avcodec_find_encoder(AV_CODEC_ID_PNG);
     const av::CodecContext context(codec != nullptr ? avcodec_alloc_context3(codec) : nullptr);
     av::Packet packet = av::NewPacket();
-    if (!context) {
+    if (!context)
         return nullptr;
-    }
     context->width = frame.width;
     context->height = frame.height;
     context->pix_fmt = AV_PIX_FMT_RGB24;
@@ -73,15 +71,13 @@ av::Packet EncodePng(const AVFrame& frame) {
 std::string ReplaceFile(const std::string& path, const AVPacket& content) {
     const std::string temporary = path + ".part";
     std::FILE* file = std::fopen(temporary.c_str(), "wbe");
-    if (file == nullptr) {
+    if (file == nullptr)
         return std::strerror(errno);
-    }
     const auto size = static_cast<std::size_t>(content.size);
     const bool written = std::fwrite(content.data, 1, size, file) == size;
     const bool closed = std::fclose(file) == 0;
-    if (written && closed && std::rename(temporary.c_str(), path.c_str()) == 0) {
+    if (written && closed && std::rename(temporary.c_str(), path.c_str()) == 0)
         return {};
-    }
     std::string reason = std::strerror(errno);
     std::remove(temporary.c_str());
     return reason;
@@ -96,9 +92,8 @@ Preview::~Preview() {
 }
 
 void Preview::Offer(const VideoImage& image) noexcept {
-    if (image.nWidth <= 0 || image.nHeight <= 0) {
+    if (image.nWidth <= 0 || image.nHeight <= 0)
         return;
-    }
     try {
         const std::lock_guard lock(mutex_);
         fresh_ = false;
@@ -123,9 +118,8 @@ void Preview::Join() {
         finishing_ = true;
     }
     changed_.notify_all();
-    if (thread_.joinable()) {
+    if (thread_.joinable())
         thread_.join();
-    }
 }
 
 std::string Preview::Finish() {
@@ -138,9 +132,8 @@ void Preview::Run() {
     std::unique_lock lock(mutex_);
     for (;;) {
         changed_.wait(lock, [&] { return fresh_ || finishing_; });
-        if (!fresh_) {
+        if (!fresh_)
             return;
-        }
         fresh_ = false;
         std::swap(picture, latest_);
         lock.unlock();
@@ -173,9 +166,8 @@ void Preview::Write(Picture& picture) {
     const av::Frame rgb = ToRgb(bgra, picture.width, picture.height);
     const av::Packet png = rgb ? EncodePng(*rgb) : nullptr;
     std::string reason = png ? ReplaceFile(path_, *png) : "the picture could not be encoded";
-    if (failure_.empty()) {
+    if (failure_.empty())
         failure_ = std::move(reason);
-    }
 }
 
 } // namespace host

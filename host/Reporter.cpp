@@ -19,18 +19,14 @@ bool WantsColour() {
 } // namespace
 
 std::unique_ptr<Reporter> MakeReporter(const Options& options, const StandardStreams& streams) {
-    if (options.progress == ProgressStyle::kJson) {
+    if (options.progress == ProgressStyle::kJson)
         return std::make_unique<JsonReporter>(streams);
-    }
-    if (options.quiet) {
+    if (options.quiet)
         return std::make_unique<QuietReporter>(streams);
-    }
-    if (options.progress == ProgressStyle::kNone) {
+    if (options.progress == ProgressStyle::kNone)
         return std::make_unique<SparseReporter>(streams);
-    }
-    if (streams.OutputIsTerminal()) {
+    if (streams.OutputIsTerminal())
         return std::make_unique<BarReporter>(streams, WantsColour());
-    }
     return std::make_unique<LineReporter>(streams);
 }
 

@@ -60,17 +60,15 @@ SoundDecoder::SoundDecoder(const Source& source, Demuxer& demuxer)
 SoundDecoder::~SoundDecoder() {
     Stop();
     demuxer_.Stop();
-    if (thread_.joinable()) {
+    if (thread_.joinable())
         thread_.join();
-    }
 }
 
 double SoundDecoder::Seek(double seconds) {
     if (!thread_.joinable()) {
         begin_ = ToMediaTime(seconds);
-        if (seconds > 0) {
+        if (seconds > 0)
             demuxer_.Seek(seconds);
-        }
     }
     return seconds;
 }
@@ -80,15 +78,12 @@ double SoundDecoder::SecondsDelivered() const {
 }
 
 AudioFrame* SoundDecoder::GetNextFrame() {
-    if (!thread_.joinable() &&
-        !demuxer_.Attempt([this] { thread_ = std::thread(&SoundDecoder::Run, this); })) {
+    if (!thread_.joinable() && !demuxer_.Attempt([this] { thread_ = std::thread(&SoundDecoder::Run, this); }))
         return nullptr;
-    }
     while (used_ == static_cast<int64_t>(current_.size())) {
         std::optional<Chunk> next = queue_.Pop();
-        if (!next) {
+        if (!next)
             return nullptr;
-        }
         current_ = std::move(*next);
         used_ = 0;
     }
@@ -124,24 +119,20 @@ void SoundDecoder::DecodeAll() {
     while (goesOn) {
         const av::Packet packet = demuxer_.Take(stream_->index);
         goesOn = decoder_.Decode(packet.get(), accept) && packet;
-        if (begin_ > 0 && timeline_->Position() == 0) {
+        if (begin_ > 0 && timeline_->Position() == 0)
             damagedBefore_ = decoder_.Damaged();
-        }
         damaged_ = decoder_.Damaged() - damagedBefore_;
     }
-    if (resampler_) {
+    if (resampler_)
         PushPlaced(std::nullopt, Resample(nullptr));
-    }
 }
 
 bool SoundDecoder::Accept(const AVFrame& frame) {
-    if (frame.nb_samples <= 0 || !FitResampler(frame)) {
+    if (frame.nb_samples <= 0 || !FitResampler(frame))
         return true;
-    }
     std::optional<int64_t> stamp;
-    if (frame.best_effort_timestamp != AV_NOPTS_VALUE) {
+    if (frame.best_effort_timestamp != AV_NOPTS_VALUE)
         stamp = source_.MediaTime(frame.best_effort_timestamp, stream_);
-    }
     return PushPlaced(stamp, Resample(&frame));
 }
 
@@ -150,12 +141,10 @@ bool SoundDecoder::FitResampler(const AVFrame& frame) {
     const bool fits = resampler_ && frame.format == inputForm_->format &&
                       frame.sample_rate == inputForm_->sample_rate &&
                       frame.ch_layout.nb_channels == inputForm_->ch_layout.nb_channels;
-    if (fits) {
+    if (fits)
         return true;
-    }
-    if (resampler_) {
+    if (resampler_)
         PushPlaced(std::nullopt, Resample(nullptr));
-    }
     inputForm_->format = frame.format;
     inputForm_->sample_rate = frame.sample_rate;
     CopyLayout(inputForm_->ch_layout, frame.ch_layout);
@@ -164,9 +153,8 @@ bool SoundDecoder::FitResampler(const AVFrame& frame) {
         &resampler, outputLayout_.Get(), OutputFormat(*source_.Info().sound), info_.format.nSampleRate,
         &inputForm_->ch_layout, static_cast<AVSampleFormat>(frame.format), frame.sample_rate, 0, nullptr);
     resampler_.reset(resampler);
-    if (result >= 0) {
+    if (result >= 0)
         result = swr_init(resampler_.get());
-    }
     if (result < 0) {
         resampler_.reset();
         av::CheckMemory(result);
@@ -178,9 +166,8 @@ bool SoundDecoder::FitResampler(const AVFrame& frame) {
 SoundDecoder::Chunk SoundDecoder::Resample(const AVFrame* frame) {
     const int inputSamples = frame != nullptr ? frame->nb_samples : 0;
     const int room = swr_get_out_samples(resampler_.get(), inputSamples);
-    if (room <= 0) {
+    if (room <= 0)
         return {};
-    }
     Chunk chunk(static_cast<std::size_t>(room * frameBytes_));
     uint8_t* output = chunk.data();
     const auto** input = frame != nullptr ? const_cast<const uint8_t**>(frame->extended_data) : nullptr;
@@ -193,18 +180,16 @@ SoundDecoder::Chunk SoundDecoder::Resample(const AVFrame* frame) {
 /// Queues the samples at their place on the timeline. False when nobody takes them any more.
 bool SoundDecoder::PushPlaced(std::optional<int64_t> stamp, const Chunk& chunk) {
     const auto placement = timeline_->Place(stamp, static_cast<int64_t>(chunk.size()) / frameBytes_);
-    if (!PushSilence(placement.silence)) {
+    if (!PushSilence(placement.silence))
         return false;
-    }
     return Push(Chunk(chunk.begin() + placement.cut * frameBytes_, chunk.end()));
 }
 
 bool SoundDecoder::PushSilence(int64_t samples) {
     while (samples > 0) {
         const int64_t part = std::min<int64_t>(samples, info_.format.nSampleRate / 10 + 1);
-        if (!Push(Chunk(static_cast<std::size_t>(part * frameBytes_)))) {
+        if (!Push(Chunk(static_cast<std::size_t>(part * frameBytes_))))
             return false;
-        }
         samples -= part;
     }
     return true;

@@ -43,9 +43,8 @@ AVRational FrameRate(const AVStream* stream) {
         const bool agree = std::abs(av_q2d(nominal) / av_q2d(average) - 1) < 0.01;
         return agree ? nominal : average;
     }
-    if (IsPlausible(average)) {
+    if (IsPlausible(average))
         return average;
-    }
     return IsPlausible(nominal) ? nominal : kFallbackFrameRate;
 }
 
@@ -57,17 +56,15 @@ bool AnnouncesItsEnd(const AVInputFormat& format) {
 /// Reads the turn that brings the stored picture upright from the container's display matrix.
 void ReadOrientation(const AVStream* stream, PictureStreamInfo& info) {
     const uint8_t* data = av_stream_get_side_data(stream, AV_PKT_DATA_DISPLAYMATRIX, nullptr);
-    if (data == nullptr) {
+    if (data == nullptr)
         return;
-    }
     int32_t matrix[9];
     std::copy_n(data, sizeof matrix, reinterpret_cast<uint8_t*>(matrix));
     const int64_t determinant =
         static_cast<int64_t>(matrix[0]) * matrix[4] - static_cast<int64_t>(matrix[1]) * matrix[3];
     info.mirrored = determinant < 0;
-    if (info.mirrored) {
+    if (info.mirrored)
         av_display_matrix_flip(matrix, 1, 0);
-    }
     const double counterClockwise = av_display_rotation_get(matrix);
     if (!std::isnan(counterClockwise)) {
         const int turns = static_cast<int>((std::lround(-counterClockwise / 90) % 4 + 4) % 4);
@@ -78,16 +75,14 @@ void ReadOrientation(const AVStream* stream, PictureStreamInfo& info) {
 
 AVRational PixelAspect(AVFormatContext* context, AVStream* stream, bool turned) {
     AVRational aspect = av_guess_sample_aspect_ratio(context, stream, nullptr);
-    if (aspect.num <= 0 || aspect.den <= 0) {
+    if (aspect.num <= 0 || aspect.den <= 0)
         return {1, 1};
-    }
     return turned ? av_inv_q(aspect) : aspect;
 }
 
 void CopyParameters(const AVCodecParameters& from, AVCodecParameters* to) {
-    if (to == nullptr) {
+    if (to == nullptr)
         throw std::bad_alloc();
-    }
     av::CheckMemory(avcodec_parameters_copy(to, &from));
 }
 
@@ -116,9 +111,8 @@ void Source::Open(const std::string& path) {
     // The prefix keeps a colon in the name from being read as a protocol.
     const std::string url = "file:" + path;
     AVFormatContext* context = avformat_alloc_context();
-    if (context == nullptr) {
+    if (context == nullptr)
         throw std::bad_alloc();
-    }
     context->pb = file_->Io();
     context->interrupt_callback = {WasInterrupted, file_.get()}; // for files that the source names
     const int result = avformat_open_input(&context, url.c_str(), nullptr, nullptr);
@@ -133,37 +127,32 @@ void Source::Open(const std::string& path) {
     input_.reset(context);
     const int found = avformat_find_stream_info(context, nullptr);
     av::CheckMemory(found);
-    if (found < 0) {
+    if (found < 0)
         throw SourceError("cannot read the streams of \"" + path + "\": " + av::ErrorText(found));
-    }
-    if (context->start_time != AV_NOPTS_VALUE) {
+    if (context->start_time != AV_NOPTS_VALUE)
         start_ = av_rescale_q(context->start_time, {1, AV_TIME_BASE}, {1, kMediaSecond});
-    }
     info_.container =
         context->iformat->long_name != nullptr ? context->iformat->long_name : context->iformat->name;
 }
 
 void Source::ChooseStreams(SourceChoice choice) {
-    for (unsigned i = 0; i < input_->nb_streams; ++i) {
+    for (unsigned i = 0; i < input_->nb_streams; ++i)
         input_->streams[i]->discard = AVDISCARD_ALL;
-    }
     if (choice.pictures) {
         const int index = av_find_best_stream(input_.get(), AVMEDIA_TYPE_VIDEO, -1, -1, nullptr, 0);
         const bool isCover =
             index >= 0 && (input_->streams[index]->disposition & AV_DISPOSITION_ATTACHED_PIC) != 0;
         if (index >= 0 && !isCover &&
-            avcodec_find_decoder(input_->streams[index]->codecpar->codec_id) != nullptr) {
+            avcodec_find_decoder(input_->streams[index]->codecpar->codec_id) != nullptr)
             DescribePictures(index);
-        }
     }
     if (choice.sound) {
         const int index = av_find_best_stream(input_.get(), AVMEDIA_TYPE_AUDIO, -1,
                                               info_.pictures ? info_.pictures->index : -1, nullptr, 0);
         if (index >= 0 && avcodec_find_decoder(input_->streams[index]->codecpar->codec_id) != nullptr &&
             input_->streams[index]->codecpar->sample_rate > 0 &&
-            input_->streams[index]->codecpar->ch_layout.nb_channels > 0) {
+            input_->streams[index]->codecpar->ch_layout.nb_channels > 0)
             DescribeSound(index);
-        }
     }
     if (!info_.pictures && !info_.sound) {
         throw SourceError("\"" + info_.path + "\" holds no " +
@@ -177,9 +166,8 @@ void Source::ChooseStreams(SourceChoice choice) {
 void Source::DescribePictures(int index) {
     AVStream* stream = input_->streams[index];
     const AVCodecParameters* parameters = stream->codecpar;
-    if (parameters->width <= 0 || parameters->height <= 0) {
+    if (parameters->width <= 0 || parameters->height <= 0)
         return;
-    }
     stream->discard = AVDISCARD_DEFAULT;
     PictureStreamInfo info;
     info.index = index;
@@ -195,9 +183,8 @@ void Source::DescribePictures(int index) {
     info.peakRate = info.frameRate;
     info.duration = EndOf(stream);
     info.interlaced = parameters->field_order > AV_FIELD_PROGRESSIVE;
-    if (IsPlausible(stream->r_frame_rate) && !info.interlaced) { // where it may count fields
+    if (IsPlausible(stream->r_frame_rate) && !info.interlaced) // where it may count fields
         info.peakRate = std::max(info.frameRate, av_q2d(stream->r_frame_rate));
-    }
     info.colorPrimaries = parameters->color_primaries;
     info.colorTransfer = parameters->color_trc;
     info.colorMatrix = parameters->color_space;
@@ -236,9 +223,8 @@ double Source::EndOf(const AVStream* stream) const {
 void Source::FindDuration() {
     const bool guessedByRate = input_->duration_estimation_method == AVFMT_DURATION_FROM_BITRATE;
     double whole = input_->duration > 0 ? static_cast<double>(input_->duration) / AV_TIME_BASE : 0;
-    if (whole > 0 && AnnouncesItsEnd(*input_->iformat)) {
+    if (whole > 0 && AnnouncesItsEnd(*input_->iformat))
         whole -= ToSeconds(start_);
-    }
     info_.durationKnown = whole > 0 && !guessedByRate;
     if (!info_.durationKnown) {
         if (const double last = LastStampSeconds(); last > 0) {
@@ -249,28 +235,24 @@ void Source::FindDuration() {
         }
     }
     const auto complete = [&](double& duration) {
-        if (duration <= 0 || !info_.durationKnown || guessedByRate) {
+        if (duration <= 0 || !info_.durationKnown || guessedByRate)
             duration = whole;
-        }
         info_.duration = std::max(info_.duration, duration);
     };
-    if (info_.pictures) {
+    if (info_.pictures)
         complete(info_.pictures->duration);
-    }
     if (info_.sound) {
         complete(info_.sound->duration);
-        if (info_.sound->duration < kShortestStream && info_.pictures) {
+        if (info_.sound->duration < kShortestStream && info_.pictures)
             info_.sound.reset();
-        }
     }
 }
 
 /// Where the last packet ends, found by reading the end of the file. 0 when the file cannot be read that way.
 /// That may describe the streams anew, as they are there; for the decoders they are as at the beginning.
 double Source::LastStampSeconds() {
-    if (!IsSeekable()) {
+    if (!IsSeekable())
         return 0;
-    }
     constexpr int64_t kTail = 2 << 20;
     const int64_t target = std::max<int64_t>(info_.bytes - kTail, 0);
     const bool byBytes = (input_->iformat->flags & AVFMT_NO_BYTE_SEEK) == 0;
@@ -287,17 +269,14 @@ double Source::LastStampSeconds() {
     while (sought >= 0 && av_read_frame(input_.get(), packet.get()) >= 0) {
         const AVStream* stream = input_->streams[packet->stream_index];
         const int64_t stamp = packet->pts != AV_NOPTS_VALUE ? packet->pts : packet->dts;
-        if (stamp != AV_NOPTS_VALUE) {
+        if (stamp != AV_NOPTS_VALUE)
             last = std::max(last, ToSeconds(MediaTime(stamp + packet->duration, stream)));
-        }
         av_packet_unref(packet.get());
     }
-    for (std::size_t i = 0; i < beginnings.size(); ++i) {
+    for (std::size_t i = 0; i < beginnings.size(); ++i)
         CopyParameters(*beginnings[i], input_->streams[i]->codecpar);
-    }
-    if (!Rewind()) {
+    if (!Rewind())
         throw SourceError("cannot read \"" + info_.path + "\" from its start again");
-    }
     return last;
 }
 
@@ -312,15 +291,13 @@ bool Source::Rewind() {
                avformat_seek_file(input_.get(), -1, 0, 0, 0, AVSEEK_FLAG_BYTE) >= 0;
     };
     // In streams for broadcast the first time lies behind the first key picture, which is decoded earlier.
-    if ((flags & AVFMT_TS_DISCONT) != 0 && toFirstByte()) {
+    if ((flags & AVFMT_TS_DISCONT) != 0 && toFirstByte())
         return true;
-    }
     // By the stream that begins first, lest the others be skipped up to where the usual one begins.
     const AVStream* first = PictureStream();
     if (const AVStream* sound = SoundStream();
-        sound != nullptr && (first == nullptr || BeginOf(sound) < BeginOf(first))) {
+        sound != nullptr && (first == nullptr || BeginOf(sound) < BeginOf(first)))
         first = sound;
-    }
     const int64_t start = first->start_time != AV_NOPTS_VALUE ? first->start_time : 0;
     const int64_t earlier = start - av_rescale_q(1, {1, 1}, first->time_base);
     return avformat_seek_file(input_.get(), first->index, INT64_MIN, earlier, start, 0) >= 0 || toFirstByte();

@@ -6,17 +6,15 @@ namespace host {
 
 std::optional<StampRepair::Stamp> StampRepair::Push(std::optional<int64_t> stamp) {
     std::optional<Stamp> settled;
-    if (held_) {
+    if (held_)
         settled = Settle(stamp);
-    }
     held_ = Held{stamp};
     return settled;
 }
 
 std::optional<StampRepair::Stamp> StampRepair::Finish() {
-    if (!held_) {
+    if (!held_)
         return std::nullopt;
-    }
     const Stamp settled = Settle(std::nullopt);
     held_.reset();
     return settled;

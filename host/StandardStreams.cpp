@@ -22,9 +22,8 @@ namespace {
 
 /// FFmpeg's messages, a line each, as they would be shown at its usual level.
 void LogFfmpeg(void* source, int level, const char* format, va_list arguments) {
-    if (level > AV_LOG_WARNING) {
+    if (level > AV_LOG_WARNING)
         return;
-    }
     static thread_local int prefix = 1;
     char line[1024];
     av_log_format_line2(source, level, format, arguments, line, sizeof line, &prefix);
@@ -69,9 +68,8 @@ int StandardStreams::Columns() const {
 void StandardStreams::Write(int descriptor, std::string_view text) {
     while (!text.empty()) {
         const ssize_t count = write(descriptor, text.data(), text.size());
-        if (count < 0 && errno != EINTR) {
+        if (count < 0 && errno != EINTR)
             return;
-        }
         text.remove_prefix(count > 0 ? static_cast<std::size_t>(count) : 0);
     }
 }

@@ -7,9 +7,8 @@ namespace host {
 StreamDecoder::StreamDecoder(const AVStream& stream, int threads) : frame_(av::NewFrame()) {
     const AVCodec* codec = avcodec_find_decoder(stream.codecpar->codec_id);
     context_.reset(avcodec_alloc_context3(codec));
-    if (!context_) {
+    if (!context_)
         throw std::bad_alloc();
-    }
     av::CheckMemory(avcodec_parameters_to_context(context_.get(), stream.codecpar));
     context_->pkt_timebase = stream.time_base;
     context_->thread_count = threads;
@@ -25,15 +24,13 @@ StreamDecoder::StreamDecoder(const AVStream& stream, int threads) : frame_(av::N
 bool StreamDecoder::Decode(const AVPacket* packet, const Sink& sink) {
     int result = avcodec_send_packet(context_.get(), packet);
     while (result == AVERROR(EAGAIN)) {
-        if (!Receive(sink)) {
+        if (!Receive(sink))
             return false;
-        }
         result = avcodec_send_packet(context_.get(), packet);
     }
     av::CheckMemory(result);
-    if (result < 0 && result != AVERROR_EOF) {
+    if (result < 0 && result != AVERROR_EOF)
         ++damaged_;
-    }
     return Receive(sink);
 }
 
@@ -41,25 +38,21 @@ bool StreamDecoder::Decode(const AVPacket* packet, const Sink& sink) {
 bool StreamDecoder::Receive(const Sink& sink) {
     for (;;) {
         const int result = avcodec_receive_frame(context_.get(), frame_.get());
-        if (result == AVERROR(EAGAIN)) {
+        if (result == AVERROR(EAGAIN))
             return true;
-        }
-        if (result == AVERROR_EOF) {
+        if (result == AVERROR_EOF)
             return false;
-        }
         av::CheckMemory(result);
         if (result < 0) {
             ++damaged_;
             return true;
         }
-        if (frame_->decode_error_flags != 0) {
+        if (frame_->decode_error_flags != 0)
             ++damaged_;
-        }
         const bool goesOn = sink(*frame_);
         av_frame_unref(frame_.get());
-        if (!goesOn) {
+        if (!goesOn)
             return false;
-        }
     }
 }
 

@@ -49,11 +49,9 @@ std::string ProgressText(const ProgressReport& report, int columns) {
     std::string line = percent;
     const std::string clip = report.clip > 0 ? fmt::format("  clip {}", report.clip) : std::string();
     for (const std::string& part :
-         {"  " + position, "  " + speed, "  " + Left(report), "  " + FormatBytes(report.bytes), clip}) {
-        if (line.size() + part.size() < static_cast<std::size_t>(columns)) {
+         {"  " + position, "  " + speed, "  " + Left(report), "  " + FormatBytes(report.bytes), clip})
+        if (line.size() + part.size() < static_cast<std::size_t>(columns))
             line += part;
-        }
-    }
     return line;
 }
 
@@ -66,9 +64,8 @@ void SparseReporter::Warning(const std::string& text) {
 }
 
 void SparseReporter::End(const EndReport& report) {
-    if (!report.summary.empty()) {
+    if (!report.summary.empty())
         Streams().Print(report.summary + "\n");
-    }
 }
 
 void LineReporter::Start(const StartReport& report) {
@@ -80,9 +77,8 @@ void LineReporter::Progress(const ProgressReport& report, bool milestone) {
     // Between clips the phase changes back and forth, which the line of the clip tells well enough.
     const bool worthALine = milestone && report.phase != Phase::kConverting &&
                             (report.phase != Phase::kFinishing || report.clip == 0);
-    if (!worthALine && report.worked < nextAt_) {
+    if (!worthALine && report.worked < nextAt_)
         return;
-    }
     nextAt_ = report.worked + kLineSeconds;
     constexpr int kAnyWidth = 1000;
     Streams().Print(ProgressText(report, kAnyWidth) + "\n");
@@ -97,9 +93,8 @@ void LineReporter::FileClosed(const FileReport& report) {
 void BarReporter::Progress(const ProgressReport& report, bool /*milestone*/) {
     const int columns = Streams().Columns();
     std::string line = ProgressText(report, columns);
-    if (report.percent && line.size() + kBarColumns + 3 < static_cast<std::size_t>(columns)) {
+    if (report.percent && line.size() + kBarColumns + 3 < static_cast<std::size_t>(columns))
         line = Bar(*report.percent) + line;
-    }
     const bool quietPhase = report.phase == Phase::kPaused || report.phase == Phase::kWaitingForRoom;
     const std::string colour = !colour_ ? "" : quietPhase ? "\x1b[33m" : "\x1b[32m";
     Streams().Print(fmt::format("{}{}{}{}", kEraseLine, colour, line, colour_ ? "\x1b[0m" : ""));

@@ -15,9 +15,8 @@ public:
 
     /// Counts the time since the last call unless the clock stands. To be called regularly.
     void Tick(Time now) {
-        if (!stands_) {
+        if (!stands_)
             worked_ += now - last_;
-        }
         last_ = now;
     }
 

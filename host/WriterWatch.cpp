@@ -41,12 +41,10 @@ WriterWatch::~WriterWatch() {
 
 std::optional<WriterWatch::News> WriterWatch::Take() {
     const std::lock_guard lock(mutex_);
-    if (std::exchange(newsLost_, false)) {
+    if (std::exchange(newsLost_, false))
         throw std::bad_alloc();
-    }
-    if (news_.empty()) {
+    if (news_.empty())
         return std::nullopt;
-    }
     std::optional<News> news(news_.front());
     news_.pop_front();
     return news;
@@ -89,9 +87,8 @@ void WriterWatch::OnEvent(void* context, int event, const WriterStatus* status) 
             watch->newsLost_ = true;
         }
     }
-    if (event == kWriterEventClosed) {
+    if (event == kWriterEventClosed)
         watch->closedBytes_ += status->llBytesWritten;
-    }
     PostHostEvent(EventKind::kWriterNews);
 }
 

@@ -46,22 +46,19 @@ ExitCode Perform(const Options& options, const StandardStreams& streams, Control
         return ExitCode::kDone;
     }
     ChooseFormat(options);
-    if (options.task == Task::kConvert) {
+    if (options.task == Task::kConvert)
         CheckOutput(options);
-    }
     Movie movie(options.input, choice);
-    if (options.task == Task::kEstimate) {
+    if (options.task == Task::kEstimate)
         return Estimate(options, movie, streams);
-    }
     const std::unique_ptr<Reporter> reporter = MakeReporter(options, streams);
     return Conversion(options, movie, *reporter, control).Run();
 }
 
 int Main(int argc, char** argv) {
     const std::optional<Options> options = ParseOptions(argc, argv);
-    if (!options) {
+    if (!options)
         return static_cast<int>(ExitCode::kDone);
-    }
     ControlInput control;
     const StandardStreams streams(options->log);
     try {

@@ -54,15 +54,14 @@ Decoded DecodeFront(std::string_view bytes) {
 
 void AppendEncoded(std::string& out, char32_t value) {
     const auto tail = [value](int shift) { return static_cast<char>(0x80U | (value >> shift & 0x3FU)); };
-    if (value < 0x80) {
+    if (value < 0x80)
         out += static_cast<char>(value);
-    } else if (value < 0x800) {
+    else if (value < 0x800)
         out += {static_cast<char>(0xC0U | value >> 6), tail(0)};
-    } else if (value < 0x10000) {
+    else if (value < 0x10000)
         out += {static_cast<char>(0xE0U | value >> 12), tail(6), tail(0)};
-    } else {
+    else
         out += {static_cast<char>(0xF0U | value >> 18), tail(12), tail(6), tail(0)};
-    }
 }
 
 } // namespace

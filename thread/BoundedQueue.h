@@ -36,9 +36,8 @@ public:
         std::unique_lock lock(mutex_);
         WaitAndTell(
             room_, lock, [&] { return finished_ || HasRoom(weight); }, sides_.full, sides_.limit);
-        if (finished_) {
+        if (finished_)
             return false;
-        }
         items_.emplace_back(std::move(item), weight);
         weight_ += weight;
         lock.unlock();
@@ -51,17 +50,15 @@ public:
         std::unique_lock lock(mutex_);
         WaitAndTell(
             item_, lock, [&] { return finished_ || !items_.empty(); }, sides_.empty, sides_.limit);
-        if (items_.empty()) {
+        if (items_.empty())
             return std::nullopt;
-        }
         std::optional<Item> item(std::move(items_.front().first));
         weight_ -= items_.front().second;
         items_.pop_front();
         const bool halfEmpty = items_.size() <= maxItems_ / 2 && weight_ <= maxWeight_ / 2;
         lock.unlock();
-        if (halfEmpty) {
+        if (halfEmpty)
             room_.notify_all();
-        }
         return item;
     }
 

@@ -106,10 +106,9 @@ int ChooseSampleRate(const AVCodec& codec, int asked, bool flashRates) {
 bool TakesLayout(const AVCodec& codec, const AVChannelLayout& layout) {
     if (codec.ch_layouts == nullptr)
         return true;
-    for (const AVChannelLayout* known = codec.ch_layouts; known->nb_channels != 0; ++known) {
+    for (const AVChannelLayout* known = codec.ch_layouts; known->nb_channels != 0; ++known)
         if (av_channel_layout_compare(known, &layout) == 0)
             return true;
-    }
     return false;
 }
 
@@ -128,10 +127,9 @@ void ChooseLayout(const AVCodec& codec, int asked, AVChannelLayout& layout) {
 AVSampleFormat ChooseSampleFormat(const AVCodec& codec, int bitsPerSample) {
     if (codec.sample_fmts == nullptr)
         return AV_SAMPLE_FMT_S16;
-    for (const AVSampleFormat* format = codec.sample_fmts; *format != AV_SAMPLE_FMT_NONE; ++format) {
+    for (const AVSampleFormat* format = codec.sample_fmts; *format != AV_SAMPLE_FMT_NONE; ++format)
         if (bitsPerSample > 16 && *format == AV_SAMPLE_FMT_S32)
             return *format;
-    }
     return codec.sample_fmts[0];
 }
 

@@ -94,10 +94,9 @@ uint32_t Canonical(uint32_t code) {
         const auto byte = static_cast<unsigned char>(code >> shift);
         upper |= static_cast<uint32_t>(std::toupper(byte) & 0xFF) << shift;
     }
-    for (const auto& [other, code_in_table] : kAliases) {
+    for (const auto& [other, code_in_table] : kAliases)
         if (other == upper)
             return code_in_table;
-    }
     return upper;
 }
 

@@ -117,10 +117,9 @@ void JoinFragments(const std::shared_ptr<ByteFile>& part, const Muxer& written, 
     if (error != AVERROR_EOF)
         throw WriterFailure(kWriterErrorFinish,
                             "The temporary file cannot be read: " + av::ErrorText(error) + ".", file.Error());
-    for (int stream = 0; stream < written.StreamCount(); ++stream) {
+    for (int stream = 0; stream < written.StreamCount(); ++stream)
         if (joined.Stream(stream).packets != written.Stream(stream).packets)
             ThrowIncomplete();
-    }
     joined.WriteTrailer();
 }
 

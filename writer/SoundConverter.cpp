@@ -39,10 +39,9 @@ void Repack(const PcmFormat& format, int channels, const uint8_t* data, int fram
     const size_t toSize = format.bits == 24 ? 4 : fromSize;
     out.assign(static_cast<size_t>(frames) * channels * toSize, 0);
     uint8_t* to = out.data() + (toSize - fromSize);
-    for (int frame = 0; frame < frames; ++frame, data += format.BytesPerFrame()) {
+    for (int frame = 0; frame < frames; ++frame, data += format.BytesPerFrame())
         for (int channel = 0; channel < channels; ++channel, to += toSize)
             std::copy_n(data + channel * fromSize, fromSize, to);
-    }
 }
 
 [[noreturn]] void ThrowUnconvertible(const PcmFormat& format, int error) {

@@ -28,11 +28,10 @@ public:
 
 private:
     __m512i CrStart(__m512i pixels) const {
-        if constexpr (Form::kCrSum == 0) {
+        if constexpr (Form::kCrSum == 0)
             return chromaStart_;
-        } else {
+        else
             return _mm512_dpbusd_epi32(chromaStart_, pixels, _mm512_set1_epi32(Form::kCrSum << 8));
-        }
     }
 
     __m512i yStart_ = _mm512_set1_epi32((16 << 16) + Form::kRounding);
