@@ -7,7 +7,7 @@
 namespace host {
 namespace {
 
-constexpr std::size_t kPicturesAhead = 4;
+constexpr std::size_t kPicturesAhead = 3;
 constexpr std::size_t kBytesAhead = 256 << 20;
 constexpr int kTrialPictures = 16;
 constexpr int kWarmUpPictures = 12;

@@ -10,7 +10,7 @@ extern "C" {
 namespace writer {
 namespace {
 
-constexpr size_t kMostPictures = 4;
+constexpr size_t kMostPictures = 3;
 constexpr size_t kMostBytes = size_t{64} << 20;
 
 size_t ByteSize(const VideoImage& image) {

@@ -24,7 +24,7 @@ namespace {
 Gate g_disk;
 
 /// What the picture encoder's full queue holds, and the picture that waits for room in it.
-constexpr int64_t kPicturesHeld = 4 + 1;
+constexpr int64_t kPicturesHeld = 3 + 1;
 
 std::unique_ptr<WriterStatus> Status() {
     auto status = std::make_unique<WriterStatus>();
