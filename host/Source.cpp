@@ -17,9 +17,10 @@ extern "C" {
 namespace host {
 namespace {
 
-constexpr double kShortestStream = 0.001; // the engine takes a shorter one for absent
-constexpr double kGuessedDuration = 3600; // for sources that tell nothing at all, such as pipes
-constexpr double kHighestFrameRate = 200; // rates above are artefacts of the container's clock
+constexpr double kShortestStream = 0.001;         // the engine takes a shorter one for absent
+constexpr double kGuessedDuration = 3600;         // for sources that tell nothing at all, such as pipes
+constexpr double kHighestFrameRate = 200;         // rates above are artefacts of the container's clock
+constexpr char kProtocols[] = "file,crypto,data"; // a playlist names files, but never opens the network
 constexpr AVRational kFallbackFrameRate{25, 1};
 
 int WasInterrupted(void* file) {
@@ -110,12 +111,18 @@ void Source::Open(const std::string& path) {
     info_.bytes = file_->Size();
     // The prefix keeps a colon in the name from being read as a protocol.
     const std::string url = "file:" + path;
-    AVFormatContext* context = avformat_alloc_context();
-    if (context == nullptr)
+    AVDictionary* settings = nullptr;
+    const bool isSet = av_dict_set(&settings, "protocol_whitelist", kProtocols, 0) >= 0 &&
+                       av_dict_set(&settings, "pattern_type", "none", 0) >= 0; // "%d" in a name is no pattern
+    AVFormatContext* context = isSet ? avformat_alloc_context() : nullptr;
+    if (context == nullptr) {
+        av_dict_free(&settings);
         throw std::bad_alloc();
+    }
     context->pb = file_->Io();
     context->interrupt_callback = {WasInterrupted, file_.get()}; // for files that the source names
-    const int result = avformat_open_input(&context, url.c_str(), nullptr, nullptr);
+    const int result = avformat_open_input(&context, url.c_str(), nullptr, &settings);
+    av_dict_free(&settings);
     av::CheckMemory(result);
     if (result < 0) {
         const std::string hint =
@@ -125,6 +132,8 @@ void Source::Open(const std::string& path) {
         throw SourceError(CannotOpen(path, hint));
     }
     input_.reset(context);
+    if (av_match_name("tty", context->iformat->name) != 0) // which draws letters as pictures
+        throw SourceError(CannotOpen(path, "it is a text, not a movie"));
     const int found = avformat_find_stream_info(context, nullptr);
     av::CheckMemory(found);
     if (found < 0)
