@@ -68,7 +68,8 @@ Conversion::Conversion(const Options& options, Movie& movie, Reporter& reporter,
 
 ExitCode Conversion::Run() {
     WarnOfSmallRoom();
-    reporter_.Start({options_.input, options_.output, length_, movie_.Info().durationKnown});
+    reporter_.Start(
+        {options_.input, options_.output, length_, movie_.Info().certainty != Certainty::kGuessed});
     control_.Arm(options_.progress == ProgressStyle::kBar && !options_.quiet);
     clock_.Skip(Now());
     if (MCStart(converter_.get(), options_.begin, options_.length.value_or(0), nullptr, OnProgress, this) !=
@@ -200,7 +201,7 @@ ProgressReport Conversion::Figures() {
     report.worked = clock_.Seconds();
     speed_.Add(report.worked, report.position);
     report.speed = speed_.Speed();
-    if (movie_.Info().durationKnown && length_ > 0) {
+    if (movie_.Info().certainty != Certainty::kGuessed && length_ > 0) {
         report.percent = std::min(report.position / length_ * 100, kMostPercent);
         report.left = speed_.Left(length_);
     }
@@ -278,7 +279,7 @@ std::optional<Failure> Conversion::Verdict() {
 }
 
 bool Conversion::EndedEarly() const {
-    return outcome_ == kOutcomeCompleted && movie_.Info().durationKnown &&
+    return outcome_ == kOutcomeCompleted && movie_.Info().certainty == Certainty::kKnown &&
            length_ - std::max(position_.load(), movie_.SoundSeconds()) > kEarlyEnd;
 }
 

@@ -20,12 +20,23 @@ std::string DescribePictures(const PictureStreamInfo& pictures) {
     return text + (pictures.interlaced ? ", interlaced\n" : "\n");
 }
 
+std::string DescribeLength(const SourceInfo& source) {
+    switch (source.certainty) {
+    case Certainty::kGuessed:
+        return "unknown";
+    case Certainty::kEstimated:
+        return "about " + FormatTime(source.duration);
+    case Certainty::kKnown:
+        break;
+    }
+    return FormatTime(source.duration, true);
+}
+
 } // namespace
 
 std::string Describe(const SourceInfo& source) {
     std::string text = fmt::format("file:      {} ({})\ncontainer: {}\nlength:    {}\n", source.path,
-                                   FormatBytes(source.bytes), source.container,
-                                   source.durationKnown ? FormatTime(source.duration, true) : "unknown");
+                                   FormatBytes(source.bytes), source.container, DescribeLength(source));
     text += source.pictures ? DescribePictures(*source.pictures) : "pictures:  none\n";
     if (source.sound) {
         const int channels = source.sound->channels;

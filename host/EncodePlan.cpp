@@ -87,14 +87,14 @@ EncodeParam PlanEncoding(const EncodeParam& defaults, const FileFormatInfo& form
 
 double LengthToConvert(const Options& options, const SourceInfo& source) {
     const double rest = source.duration - options.begin;
-    if (rest <= 0 && source.durationKnown) {
+    if (rest <= 0 && source.certainty == Certainty::kKnown) {
         throw Failure(ExitCode::kUsage,
                       fmt::format("--begin is not before the end of \"{}\", which is {:.3f} s long",
                                   source.path, source.duration));
     }
     if (!options.length)
-        return rest;
-    return source.durationKnown ? std::min(*options.length, rest) : *options.length;
+        return std::max(rest, 0.0);
+    return source.certainty == Certainty::kKnown ? std::min(*options.length, rest) : *options.length;
 }
 
 } // namespace host

@@ -17,9 +17,11 @@ extern "C" {
 namespace host {
 namespace {
 
-constexpr double kShortestStream = 0.001;         // the engine takes a shorter one for absent
-constexpr double kGuessedDuration = 3600;         // for sources that tell nothing at all, such as pipes
-constexpr double kHighestFrameRate = 200;         // rates above are artefacts of the container's clock
+constexpr double kShortestStream = 0.001;  // the engine takes a shorter one for absent
+constexpr double kGuessedDuration = 3600;  // for sources that tell nothing at all, such as pipes
+constexpr int64_t kStretchBytes = 2 << 20; // read at the end, and at the beginning, to find the duration
+constexpr double kClockStart = 1;         // a stamp below, far into the file, shows that they do not count on
+constexpr double kHighestFrameRate = 200; // rates above are artefacts of the container's clock
 constexpr char kProtocols[] = "file,crypto,data"; // a playlist names files, but never opens the network
 constexpr AVRational kFallbackFrameRate{25, 1};
 
@@ -95,14 +97,20 @@ std::string LayoutName(const AVChannelLayout& layout) {
 
 } // namespace
 
-Source::Source(const std::string& path, SourceChoice choice) {
+double SourceInfo::Announced(double seconds) const {
+    return certainty == Certainty::kKnown ? seconds : std::max(2 * seconds, kGuessedDuration);
+}
+
+Source::Source(const std::string& path, SourceChoice choice) : choice_(choice) {
     info_.path = path;
-    Open(path);
-    ChooseStreams(choice);
+    Open();
     FindDuration();
 }
 
-void Source::Open(const std::string& path) {
+/// Opens the file, again if it is open, and chooses its streams.
+void Source::Open() {
+    const std::string& path = info_.path;
+    input_.reset();
     try {
         file_ = std::make_unique<InputFile>(path);
     } catch (const std::system_error& error) {
@@ -142,12 +150,13 @@ void Source::Open(const std::string& path) {
         start_ = av_rescale_q(context->start_time, {1, AV_TIME_BASE}, {1, kMediaSecond});
     info_.container =
         context->iformat->long_name != nullptr ? context->iformat->long_name : context->iformat->name;
+    ChooseStreams();
 }
 
-void Source::ChooseStreams(SourceChoice choice) {
+void Source::ChooseStreams() {
     for (unsigned i = 0; i < input_->nb_streams; ++i)
         input_->streams[i]->discard = AVDISCARD_ALL;
-    if (choice.pictures) {
+    if (choice_.pictures) {
         const int index = av_find_best_stream(input_.get(), AVMEDIA_TYPE_VIDEO, -1, -1, nullptr, 0);
         const bool isCover =
             index >= 0 && (input_->streams[index]->disposition & AV_DISPOSITION_ATTACHED_PIC) != 0;
@@ -155,7 +164,7 @@ void Source::ChooseStreams(SourceChoice choice) {
             avcodec_find_decoder(input_->streams[index]->codecpar->codec_id) != nullptr)
             DescribePictures(index);
     }
-    if (choice.sound) {
+    if (choice_.sound) {
         const int index = av_find_best_stream(input_.get(), AVMEDIA_TYPE_AUDIO, -1,
                                               info_.pictures ? info_.pictures->index : -1, nullptr, 0);
         if (index >= 0 && avcodec_find_decoder(input_->streams[index]->codecpar->codec_id) != nullptr &&
@@ -165,9 +174,9 @@ void Source::ChooseStreams(SourceChoice choice) {
     }
     if (!info_.pictures && !info_.sound) {
         throw SourceError("\"" + info_.path + "\" holds no " +
-                          (choice.pictures && choice.sound ? "pictures and no sound"
-                           : choice.pictures               ? "pictures"
-                                                           : "sound") +
+                          (choice_.pictures && choice_.sound ? "pictures and no sound"
+                           : choice_.pictures                ? "pictures"
+                                                             : "sound") +
                           " that can be decoded");
     }
 }
@@ -231,23 +240,18 @@ double Source::EndOf(const AVStream* stream) const {
 
 void Source::FindDuration() {
     const bool guessedByRate = input_->duration_estimation_method == AVFMT_DURATION_FROM_BITRATE;
-    double whole = input_->duration > 0 ? static_cast<double>(input_->duration) / AV_TIME_BASE : 0;
-    if (whole > 0 && AnnouncesItsEnd(*input_->iformat))
-        whole -= ToSeconds(start_);
-    info_.durationKnown = whole > 0 && !guessedByRate;
-    if (!info_.durationKnown) {
-        if (const double last = LastStampSeconds(); last > 0) {
-            whole = last;
-            info_.durationKnown = true;
-        } else if (whole <= 0) {
-            whole = kGuessedDuration;
-        }
-    }
+    info_.duration = input_->duration > 0 ? static_cast<double>(input_->duration) / AV_TIME_BASE : 0;
+    if (info_.duration > 0 && AnnouncesItsEnd(*input_->iformat))
+        info_.duration -= ToSeconds(start_);
+    if (info_.duration <= 0 || guessedByRate)
+        MeasureDuration();
+    const double whole = info_.duration;
     const auto complete = [&](double& duration) {
-        if (duration <= 0 || !info_.durationKnown || guessedByRate)
+        if (duration <= 0 || info_.certainty != Certainty::kKnown || guessedByRate)
             duration = whole;
         info_.duration = std::max(info_.duration, duration);
     };
+    info_.duration = 0;
     if (info_.pictures)
         complete(info_.pictures->duration);
     if (info_.sound) {
@@ -257,36 +261,71 @@ void Source::FindDuration() {
     }
 }
 
-/// Where the last packet ends, found by reading the end of the file. 0 when the file cannot be read that way.
-/// That may describe the streams anew, as they are there; for the decoders they are as at the beginning.
-double Source::LastStampSeconds() {
-    if (!IsSeekable())
-        return 0;
-    constexpr int64_t kTail = 2 << 20;
-    const int64_t target = std::max<int64_t>(info_.bytes - kTail, 0);
-    const bool byBytes = (input_->iformat->flags & AVFMT_NO_BYTE_SEEK) == 0;
-    const int sought =
-        byBytes ? avformat_seek_file(input_.get(), -1, INT64_MIN, target, INT64_MAX, AVSEEK_FLAG_BYTE)
-                : avformat_seek_file(input_.get(), -1, INT64_MIN, INT64_MAX / 2, INT64_MAX, 0);
+/// Finds out by reading the end of the file how long it is, and its beginning too where the stamps are
+/// counted from wherever reading starts.
+void Source::MeasureDuration() {
+    Stretch tail;
+    bool countsOn = true;
+    if (IsSeekable()) {
+        const int64_t target = std::max<int64_t>(info_.bytes - kStretchBytes, 0);
+        const bool byBytes = (input_->iformat->flags & AVFMT_NO_BYTE_SEEK) == 0;
+        const int sought =
+            byBytes ? avformat_seek_file(input_.get(), -1, INT64_MIN, target, INT64_MAX, AVSEEK_FLAG_BYTE)
+                    : avformat_seek_file(input_.get(), -1, INT64_MIN, INT64_MAX / 2, INT64_MAX, 0);
+        if (sought >= 0)
+            tail = ReadStretch(INT64_MAX);
+        countsOn = !byBytes || target == 0 || tail.first > kClockStart;
+        if (countsOn)
+            ReturnToBegin();
+        else
+            Open(); // or seeking would take the end's wrong stamps for places
+    }
+    if (tail.end > 0 && countsOn) {
+        info_.duration = tail.end;
+        return;
+    }
+    if (tail.length > 0) {
+        const Stretch head = ReadStretch(kStretchBytes);
+        ReturnToBegin();
+        info_.duration = static_cast<double>(info_.bytes) * (head.length + tail.length) /
+                         static_cast<double>(head.bytes + tail.bytes);
+    }
+    info_.certainty = info_.duration > 0 ? Certainty::kEstimated : Certainty::kGuessed;
+    if (info_.duration <= 0)
+        info_.duration = kGuessedDuration;
+}
+
+/// Reads to the end or for `mostBytes`. That may describe the streams anew, as they are there; for the
+/// decoders they are as at the beginning.
+Source::Stretch Source::ReadStretch(int64_t mostBytes) {
     std::vector<av::CodecParameters> beginnings;
     for (unsigned i = 0; i < input_->nb_streams; ++i) {
         beginnings.emplace_back(avcodec_parameters_alloc());
         CopyParameters(*input_->streams[i]->codecpar, beginnings[i].get());
     }
-    double last = 0;
+    const int counted = info_.pictures ? info_.pictures->index : info_.sound->index;
+    Stretch stretch;
     const av::Packet packet = av::NewPacket();
-    while (sought >= 0 && av_read_frame(input_.get(), packet.get()) >= 0) {
+    while (stretch.bytes < mostBytes && av_read_frame(input_.get(), packet.get()) >= 0) {
         const AVStream* stream = input_->streams[packet->stream_index];
+        stretch.bytes += packet->size;
+        if (packet->stream_index == counted)
+            stretch.length += static_cast<double>(packet->duration) * av_q2d(stream->time_base);
         const int64_t stamp = packet->pts != AV_NOPTS_VALUE ? packet->pts : packet->dts;
-        if (stamp != AV_NOPTS_VALUE)
-            last = std::max(last, ToSeconds(MediaTime(stamp + packet->duration, stream)));
+        if (stamp != AV_NOPTS_VALUE) {
+            stretch.first = std::min(stretch.first, ToSeconds(MediaTime(stamp, stream)));
+            stretch.end = std::max(stretch.end, ToSeconds(MediaTime(stamp + packet->duration, stream)));
+        }
         av_packet_unref(packet.get());
     }
     for (std::size_t i = 0; i < beginnings.size(); ++i)
         CopyParameters(*beginnings[i], input_->streams[i]->codecpar);
+    return stretch;
+}
+
+void Source::ReturnToBegin() {
     if (!Rewind())
         throw SourceError("cannot read \"" + info_.path + "\" from its start again");
-    return last;
 }
 
 bool Source::IsSeekable() const {

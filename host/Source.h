@@ -6,6 +6,7 @@
 #include "host/InputFile.h"
 
 #include <cstdint>
+#include <limits>
 #include <memory>
 #include <optional>
 #include <stdexcept>
@@ -19,6 +20,9 @@ class SourceError : public std::runtime_error {
 public:
     using std::runtime_error::runtime_error;
 };
+
+/// How a duration was found: told by the source, reckoned from its size and parts of it, or not at all.
+enum class Certainty { kKnown, kEstimated, kGuessed };
 
 struct PictureStreamInfo {
     int index = -1;          ///< Stream number in the container.
@@ -51,12 +55,16 @@ struct SoundStreamInfo {
 
 struct SourceInfo {
     std::string path;
-    std::string container;      ///< FFmpeg's long name.
-    int64_t bytes = 0;          ///< Size of the file, 0 when it has none.
-    double duration = 0;        ///< Seconds; the longer of the streams'.
-    bool durationKnown = false; ///< False when `duration` is no more than a guess.
+    std::string container;                   ///< FFmpeg's long name.
+    int64_t bytes = 0;                       ///< Size of the file, 0 when it has none.
+    double duration = 0;                     ///< Seconds; the longer of the streams'.
+    Certainty certainty = Certainty::kKnown; ///< Of `duration`.
     std::optional<PictureStreamInfo> pictures;
     std::optional<SoundStreamInfo> sound;
+
+    /// What to announce of a stream of `seconds` to the engine, which converts no sound beyond: more than
+    /// enough where nobody knows.
+    double Announced(double seconds) const;
 };
 
 struct SourceChoice {
@@ -91,15 +99,26 @@ public:
     void Interrupt() { file_->Interrupt(); }
 
 private:
-    void Open(const std::string& path);
-    void ChooseStreams(SourceChoice choice);
+    /// What the packets of a part of the source tell, in seconds from its start.
+    struct Stretch {
+        int64_t bytes = 0;
+        double first = std::numeric_limits<double>::infinity(); // stamp
+        double end = 0;                                         // of what lasts longest
+        double length = 0; // of the packets of one stream, pictures if there are any
+    };
+
+    void Open();
+    void ChooseStreams();
     void DescribePictures(int index);
     void DescribeSound(int index);
     double BeginOf(const AVStream* stream) const;
     double EndOf(const AVStream* stream) const;
     void FindDuration();
-    double LastStampSeconds();
+    void MeasureDuration();
+    Stretch ReadStretch(int64_t mostBytes);
+    void ReturnToBegin();
 
+    const SourceChoice choice_;
     std::unique_ptr<InputFile> file_;
     av::Input input_;
     int64_t start_ = 0; // the container's first stamp, in media time
