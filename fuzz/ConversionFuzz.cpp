@@ -4,7 +4,6 @@
 #include "tests/engine/ScriptedHost.h"
 
 #include <cmath>
-#include <cstring>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -179,11 +178,6 @@ private:
     size_t position = 0;
 };
 
-template <class Record>
-bool SameBytes(const Record& one, const Record& other) {
-    return std::memcmp(&one, &other, sizeof one) == 0;
-}
-
 /// Goes through what one conversion did and holds it against what is promised.
 class Inspection {
 public:
@@ -191,8 +185,7 @@ public:
         : video(pictureSource), audio(soundSource), reports(hasCallback) {}
 
     void Run() {
-        const std::vector<std::string> trace = recorder::Trace();
-        for (const std::string& line : trace)
+        for (const std::string& line : recording.trace)
             if (line.rfind("log ", 0) != 0)
                 Read(line);
         FUZZ_CHECK(open == 0);
@@ -264,7 +257,7 @@ private:
     void Picture(int file) {
         FUZZ_CHECK(file == open && loop != Loop::kSound);
         const VideoImage source = video.Picture(pictures);
-        const VideoImage written = recordedPictures.at(pictures++);
+        const VideoImage written = recording.pictures.at(pictures++);
         VideoImage moved = source;
         if (loop == Loop::kBoth) {
             moved.llTime = Add(source.llTime, shift);
@@ -278,7 +271,7 @@ private:
 
     void Sound(int file) {
         FUZZ_CHECK(file == open && loop != Loop::kPictures);
-        const AudioFrame written = recordedSounds.at(sounds++);
+        const AudioFrame written = recording.sounds.at(sounds++);
         if (written.nType == kMediaTypeSilence)
             Silence(written);
         else
@@ -330,8 +323,7 @@ private:
     const ListedVideo& video;
     const ListedAudio& audio;
     const bool reports;
-    const std::vector<AudioFrame> recordedSounds = recorder::Sounds();
-    const std::vector<VideoImage> recordedPictures = recorder::Pictures();
+    const recorder::Recording recording = recorder::Recorded();
     std::string_view rest;
     std::string before;
     Loop loop = Loop::kNone;
@@ -407,13 +399,13 @@ void FuzzConversion(FuzzedDataProvider& input) {
     MCSetOutputFile(host.handle, name.c_str());
 
     for (int round = input.ConsumeIntegralInRange(1, 2); round > 0; --round) {
-        recorder::Reset();
         video.Rewind();
         audio.Rewind();
         const int split = input.ConsumeIntegralInRange(0, 2);
         MCSetSplitParam(host.handle, split, WildInteger<unsigned long>(input, 100));
         const int firstFailure = input.ConsumeIntegralInRange(0, 8);
-        recorder::FailCreates({firstFailure, firstFailure + input.ConsumeIntegralInRange(0, 8)});
+        const int secondFailure = firstFailure + input.ConsumeIntegralInRange(0, 8);
+        recorder::Reset({.failingCreates = {firstFailure, secondFailure}});
         host.cancelAt = input.ConsumeIntegralInRange(0U, 15U);
         const int before = MCGetTargetCount(host.handle);
         const int started = host.Start(WildDouble(input, 0.0), WildDouble(input, 0.0));

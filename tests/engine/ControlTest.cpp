@@ -4,7 +4,10 @@
 
 #include <gtest/gtest.h>
 
+#include <atomic>
+#include <string_view>
 #include <thread>
+#include <utility>
 
 namespace {
 
@@ -19,54 +22,47 @@ public:
     std::atomic<int> pictures{0};
 };
 
-/// Waits until `condition` holds; a condition that never does ends in the test program's time limit.
-template <class Condition>
-void Await(Condition condition) {
-    while (!condition())
-        std::this_thread::sleep_for(std::chrono::milliseconds(1));
-}
-
+// What is waited for in vain ends in the test program's time limit.
 class ControlTest : public testing::Test {
 protected:
     ControlTest() { recorder::Reset(); }
     ~ControlTest() override { MCDestroy(handle); }
 
-    void StartEndless() {
-        handle = MCCreate(&video, nullptr);
-        ASSERT_EQ(MCStart(handle, 0.0, 0.0, nullptr, nullptr, nullptr), 0);
-        Await([&] { return video.pictures > 0; });
+    /// Waits until the worker stands still.
+    void AwaitStandstill() {
+        for (int before = -1; before != video.pictures;) {
+            before = video.pictures;
+            std::this_thread::sleep_for(std::chrono::milliseconds(30));
+        }
     }
 
-    /// True when the worker stands still.
-    bool Stands() {
-        std::this_thread::sleep_for(std::chrono::milliseconds(50)); // for the iteration under way
-        const int before = video.pictures;
-        std::this_thread::sleep_for(std::chrono::milliseconds(30));
-        return video.pictures == before;
-    }
-
+    /// Waits until the worker has moved on.
     void AwaitProgress() {
-        const int before = video.pictures;
-        Await([&] { return video.pictures > before; });
+        for (const int before = video.pictures; video.pictures == before;)
+            std::this_thread::sleep_for(std::chrono::milliseconds(1));
     }
 
     EndlessVideo video;
     MCHandle handle = nullptr;
 };
 
-TEST_F(ControlTest, PausesNest) {
-    StartEndless();
+TEST_F(ControlTest, PausesNestAndEndWithTheConverter) {
+    handle = MCCreate(&video, nullptr);
+    ASSERT_EQ(MCStart(handle, 0.0, 0.0, nullptr, nullptr, nullptr), 0);
+    AwaitProgress();
     EXPECT_EQ(MCPause(handle), 1);
     EXPECT_EQ(MCPause(handle), 2);
-    EXPECT_TRUE(Stands());
+    AwaitStandstill();
     EXPECT_EQ(MCResume(handle), 1);
-    EXPECT_TRUE(Stands());
+    AwaitStandstill();
     EXPECT_EQ(MCResume(handle), 0);
     AwaitProgress();
     EXPECT_EQ(MCResume(handle), 0);
     AwaitProgress();
     EXPECT_EQ(MCPause(handle), 1);
-    EXPECT_TRUE(Stands());
+    AwaitStandstill();
+    MCDestroy(std::exchange(handle, nullptr));
+    EXPECT_NE(TraceWithoutLog().find("event finished 1\n"), std::string::npos);
 }
 
 TEST_F(ControlTest, IdleConverterDoesNothing) {
@@ -77,14 +73,6 @@ TEST_F(ControlTest, IdleConverterDoesNothing) {
     EXPECT_EQ(MCStop(handle), 0);
     EXPECT_EQ(MCWait(handle, MC_INFINITE), 0);
     EXPECT_EQ(TraceWithoutLog(), "");
-}
-
-TEST_F(ControlTest, DestroyEndsTheConversion) {
-    StartEndless();
-    MCPause(handle);
-    MCDestroy(handle);
-    handle = nullptr;
-    EXPECT_NE(TraceWithoutLog().find("event finished 1\n"), std::string::npos);
 }
 
 // Whatever the order in which a pause and a stop meet, the worker must not sleep on.
@@ -155,6 +143,7 @@ TEST(DispatchTest, ChoosesTheLoopByTheStreams) {
         host.video.Format().dDuration = test.videoDuration;
         host.audio.Format().dDuration = test.audioDuration;
         host.Change([&](EncodeParam& param) {
+            param.nWidth = 99;
             param.bNoVideo = test.noVideo;
             param.bNoAudio = test.noAudio;
         });
@@ -163,6 +152,11 @@ TEST(DispatchTest, ChoosesTheLoopByTheStreams) {
         EXPECT_EQ(trace.substr(0, trace.find('\n')),
                   std::string("create out.mp4 ") + test.formats + " -> #1");
 
+        const EncodeParam param = recorder::Recorded().params.at(0);
+        EXPECT_EQ(param.nWidth, 99);
+        EXPECT_EQ(param.bNoVideo, test.formats[0] == '-');
+        EXPECT_EQ(param.bNoAudio, test.noAudio || std::string_view(test.formats).back() == '-');
+
         recorder::Reset();
         host.Convert();
         EXPECT_EQ(LogLines().find("Without Video Decoder") == std::string::npos, test.keepsVideo);
@@ -170,33 +164,13 @@ TEST(DispatchTest, ChoosesTheLoopByTheStreams) {
     }
 }
 
-/// Describes itself only so many times.
-class ForgetfulVideo : public ScriptedVideo {
-public:
-    VideoSourceInfo* GetVideoInfo() override {
-        return descriptions-- > 0 ? ScriptedVideo::GetVideoInfo() : nullptr;
-    }
-    int descriptions = 0;
-};
-
 // The one failure that comes without an event.
 TEST(DispatchTest, TellsOfMissingPicturesByTheCallbackAlone) {
-    recorder::Reset();
-    ForgetfulVideo video;
-    video.stamps = {0};
-    video.descriptions = 1000;
-    ScriptedHost host; // for its callback
-    host.handle = MCCreate(&video, nullptr);
-    MCStart(host.handle, 0.0, 0.0, nullptr, ScriptedHost::Callback, &host);
-    MCWait(host.handle, MC_INFINITE);
-    const int usual = 1000 - video.descriptions;
-
-    recorder::Reset();
-    video.descriptions = usual - 2; // all but the constructor's and the loop's own
-    MCStart(host.handle, 0.0, 0.0, nullptr, ScriptedHost::Callback, &host);
-    MCWait(host.handle, MC_INFINITE);
-    EXPECT_EQ(TraceWithoutLog(), "finished 3 without record\n");
-    EXPECT_NE(LogLines().find("MovieConv::Without video decoder.\nEncoding thread Exit.\n"),
+    ScriptedHost host;
+    host.SetMovie(1, 0);
+    host.video.descriptions = 5; // all but the loop's own
+    EXPECT_EQ(host.Convert(), "finished 3 without record\n");
+    EXPECT_NE(LogLines().find("log MovieConv::Without video decoder.\nlog Encoding thread Exit.\n"),
               std::string::npos);
 }
 

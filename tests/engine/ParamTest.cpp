@@ -5,31 +5,16 @@
 
 #include <climits>
 #include <cmath>
-#include <cstring>
 #include <cwchar>
 #include <utility>
 
 namespace {
 
-/// The record's fields as text, in their order.
-std::string Describe(const EncodeParam& p) {
-    char text[400];
-    snprintf(text, sizeof text,
-             "%.4s %.4s %d %d %d %g %d %d %d %d %u%u%u%u%u %.4s %d %d %d %d %d %d %d %d %.4s",
-             reinterpret_cast<const char*>(&p.fccVideo), reinterpret_cast<const char*>(&p.fccColorFormat),
-             p.nBitCount, p.nWidth, p.nHeight, p.dFrameRate, p.nVideoRateMode, p.nVideoBitrate,
-             p.nVideoMaxBitrate, p.bResize, p.nReserved[0], p.nReserved[1], p.nReserved[2], p.nReserved[3],
-             p.nReserved[4], reinterpret_cast<const char*>(&p.fccAudio), p.nSampleRate, p.nChannels,
-             p.nBitsPerSample, p.nAudioRateMode, p.nAudioBitrate, p.nAudioMaxBitrate, p.bNoVideo, p.bNoAudio,
-             reinterpret_cast<const char*>(&p.fccFileFormat));
-    return text;
-}
-
 class ParamTest : public testing::Test {
 protected:
     ParamTest() {
         host.video.Format() = {640, 480, 29.97, 12.5};
-        host.audio.Format() = {44100, 2, 8, 176400, 0.125};
+        host.audio.Format() = {44100, 6, 8, 176400, 0.125};
     }
 
     EncodeParam Get() {
@@ -46,23 +31,23 @@ protected:
     ScriptedHost host;
 };
 
-TEST_F(ParamTest, DefaultsComeFromTheSourcesThatThereAre) {
-    struct {
-        bool hasVideo, videoOpens, audioOpens;
-        const char *pictures, *sound;
-    } const cases[] = {
-        {true, true, true, "640 480 29.97", "44100"},
-        {true, false, false, "320 240 24", "22050"},
-        {false, true, true, "320 240 24", "44100"},
-    };
-    for (const auto& test : cases) {
-        host.hasVideo = test.hasVideo;
-        host.video.opens = test.videoOpens;
-        host.audio.opens = test.audioOpens;
+TEST_F(ParamTest, DefaultsComeFromTheSourcesThatOpen) {
+    constexpr uint32_t kXvid = FourCC("XVID");
+    constexpr uint32_t kYv12 = FourCC("YV12");
+    constexpr uint32_t kAac = FourCC("AAC ");
+    constexpr uint32_t kMp4 = FourCC("MP4 ");
+    for (const auto& [video, audio] : {std::pair{true, true}, {true, false}, {false, true}}) {
+        host.video.descriptions = video ? INT_MAX : 0;
+        host.audio.descriptions = audio ? INT_MAX : 0;
         host.Create();
-        EXPECT_EQ(Describe(Get()), std::string("XVID YV12 12 ") + test.pictures +
-                                       " 0 512000 0 0 00000 AAC  " + test.sound +
-                                       " 2 16 0 128000 0 0 0 MP4 ");
+        const int width = video ? 640 : 320;
+        const int height = video ? 480 : 240;
+        const double fps = video ? 29.97 : 24.0;
+        const int rate = audio ? 44100 : 22050;
+        const int channels = audio ? 6 : 2;
+        const EncodeParam expected{kXvid, kYv12, 12,       width, height, fps,    0, 512000, 0, 0,   {},
+                                   kAac,  rate,  channels, 16,    0,      128000, 0, 0,      0, kMp4};
+        EXPECT_TRUE(SameBytes(Get(), expected)) << video << audio;
         EXPECT_EQ(MCGetEncodeParam(host.handle, nullptr), 1);
         MCDestroy(std::exchange(host.handle, nullptr));
     }
@@ -72,21 +57,15 @@ TEST_F(ParamTest, ZerosAreCompletedAndLoggedAsTheyCame) {
     host.Create();
     EncodeParam param{};
     param.nReserved[4] = 9;
-    const EncodeParam set = Set(param);
-    param.nWidth = 640;
-    param.nHeight = 480;
-    param.dFrameRate = 29.97;
-    param.nVideoBitrate = 512000;
-    param.nSampleRate = 44100;
-    param.nChannels = 2;
-    param.nBitsPerSample = 8;
-    param.nAudioBitrate = 64000;
-    EXPECT_EQ(std::memcmp(&set, &param, sizeof set), 0);
+    const EncodeParam expected{0, 0,     0, 640, 480, 29.97, 0, 512000, 0, 0, {0, 0, 0, 0, 9}, // pictures
+                               0, 44100, 6, 8,   0,   64000, 0,                                // sound
+                               0, 0,     0};
+    EXPECT_TRUE(SameBytes(Set(param), expected));
     EXPECT_EQ(LogLines(),
-              "Halvane::SetEncodeParam: Flie format[], Video[] (0x0) 0.000000fps, 0bps 0 0bps "
+              "log Halvane::SetEncodeParam: Flie format[], Video[] (0x0) 0.000000fps, 0bps 0 0bps "
               "Resize:0\\t\\tAudio[]0channels 0Hz , 0bps 0 0bps\n"
-              "Halvane::Source Video Info: (640x480) 29.970000fps, 12.500000 seconds.\n"
-              "Halvane::Source Audio Info: 44100Hz 2channels, 176400bps 8bits 1.250000e-01second.\n");
+              "log Halvane::Source Video Info: (640x480) 29.970000fps, 12.500000 seconds.\n"
+              "log Halvane::Source Audio Info: 44100Hz 6channels, 176400bps 8bits 1.250000e-01second.\n");
 
     recorder::Reset();
     EXPECT_EQ(MCSetEncodeParam(host.handle, nullptr), 1); // completes what is set
@@ -96,28 +75,14 @@ TEST_F(ParamTest, ZerosAreCompletedAndLoggedAsTheyCame) {
 
 TEST_F(ParamTest, LogsEveryValueInItsPlace) {
     host.hasVideo = false;
-    host.audio.opens = false;
+    host.audio.descriptions = 0;
     host.Create();
-    EncodeParam param{};
-    param.fccFileFormat = FourCC("AVI ");
-    param.fccVideo = FourCC("H264");
-    param.fccAudio = FourCC("MP3 ");
-    param.nWidth = 1;
-    param.nHeight = -2;
-    param.dFrameRate = 250.0;
-    param.nVideoBitrate = 4;
-    param.nVideoRateMode = 5;
-    param.nVideoMaxBitrate = 6;
-    param.bResize = 7;
-    param.nChannels = 8;
-    param.nSampleRate = 9;
-    param.nAudioBitrate = 10;
-    param.nAudioRateMode = 11;
-    param.nAudioMaxBitrate = 12;
-    const EncodeParam set = Set(param);
-    EXPECT_EQ(std::memcmp(&set, &param, sizeof set), 0) << "there is nothing to complete it from";
+    const EncodeParam param{
+        FourCC("H264"), 0, 0, 1, -2, 250.0, 5, 4, 6, 7, {}, FourCC("MP3 "), 9, 8, 0, 11, 10, 12, 0, 0,
+        FourCC("AVI ")};
+    EXPECT_TRUE(SameBytes(Set(param), param)) << "there is nothing to complete it from";
     EXPECT_EQ(LogLines(),
-              "Halvane::SetEncodeParam: Flie format[AVI ], Video[H264] (1x-2) 250.000000fps, 4bps 5 6bps "
+              "log Halvane::SetEncodeParam: Flie format[AVI ], Video[H264] (1x-2) 250.000000fps, 4bps 5 6bps "
               "Resize:7\\t\\tAudio[MP3 ]8channels 9Hz , 10bps 11 12bps\n");
 }
 
@@ -131,7 +96,7 @@ TEST_F(ParamTest, FrameRatesAbove200AreNotBelieved) {
     param.dFrameRate = -1.0;
     host.video.Format().dFrameRate = 1000.0;
     EXPECT_EQ(+Set(param).dFrameRate, 30.0);
-    host.video.opens = false;
+    host.video.descriptions = 0;
     param.dFrameRate = 500.0;
     param.nVideoBitrate = 0;
     EXPECT_EQ(+Set(param).dFrameRate, 30.0);
@@ -140,11 +105,7 @@ TEST_F(ParamTest, FrameRatesAbove200AreNotBelieved) {
 
 TEST_F(ParamTest, FormatsSwitchOffWhatTheyCannotCarry) {
     const auto format = [](uint32_t code, int hasAudio, int hasVideo) {
-        FileFormatInfo info{};
-        info.fccFormat = code;
-        info.bHasAudio = hasAudio;
-        info.bHasVideo = hasVideo;
-        return info;
+        return FileFormatInfo{code, "", "", {}, {}, {}, hasAudio, hasVideo, {}};
     };
     const FileFormatInfo table[] = {format(FourCC("MP3 "), 1, 0), format(FourCC("GIF "), 0, 1),
                                     format(FourCC("MP4 "), 1, 1), FileFormatInfo{},
@@ -156,7 +117,7 @@ TEST_F(ParamTest, FormatsSwitchOffWhatTheyCannotCarry) {
                  {FourCC("GIF "), 0, 0, 1},
                  {FourCC("WAV "), 0, 0, 0},
                  {FourCC("MP4 "), 7, 7, 0}}; // the table never switches on
-    recorder::SetFormatTable(table);
+    recorder::Reset({.formats = table});
     host.Create();
     EncodeParam param = Get();
     for (const auto& test : cases) {
@@ -168,58 +129,41 @@ TEST_F(ParamTest, FormatsSwitchOffWhatTheyCannotCarry) {
     }
 }
 
-TEST_F(ParamTest, WriterGetsTheParametersInForce) {
-    host.video.stamps = {0};
-    host.hasAudio = false;
-    host.Create();
-    EncodeParam param = Get();
-    param.nWidth = 99;
-    Set(param);
-    host.Convert();
-    ASSERT_EQ(recorder::Params().size(), 1U);
-    EXPECT_EQ(recorder::Params()[0].nWidth, 99);
-    EXPECT_EQ(recorder::Params()[0].bNoAudio, 1);
-    EXPECT_EQ(recorder::Params()[0].bNoVideo, 0);
-}
-
-struct Estimate {
-    int32_t videoMode, video, videoMax, noVideo;
-    int32_t audioMode, audio, audioMax, noAudio;
-    double seconds;
-    long long bytes;
-};
-
 TEST(EstimateTest, FollowsTheRates) {
-    const Estimate cases[] = {
-        {0, 512000, 0, 0, 0, 128000, 0, 0, 60.0, 4800000},   {0, 512000, 0, 1, 0, 128000, 0, 0, 10.0, 160000},
-        {0, 512000, 0, 0, 0, 128000, 0, 1, 10.0, 640000},    {1, 512000, 1000000, 0, 0, 0, 0, 0, 8.0, 804800},
-        {0, 0, 0, 0, -1, 19, 19, 0, 8.0, 18 / 8 * 8},     // 7 + 11: each quotient is cut by itself
-        {1, 600000000, 0, 0, 0, 0, 0, 0, 1.0, -23687091}, // 4 * 600000000 wraps to -1894967296
-        {1, 0, 400000000, 0, 0, 0, 0, 0, 1.0, -23687091}, // 6 * 400000000 wraps as well
-        {0, INT_MAX, 0, 0, 0, 1, 0, 0, 1.0, INT_MIN / 8}, // and so does the sum
-        {0, 512000, 0, 0, 0, 128000, 0, 0, 0.000001, 0},     {0, 512000, 0, 0, 0, 128000, 0, 0, 0.00001, 0},
-        {0, 512000, 0, 0, 0, 128000, 0, 0, 0.00002, 1},      {0, 512000, 0, 0, 0, 128000, 0, 0, -5.0, 0},
-        {0, 512000, 0, 0, 0, 128000, 0, 0, 1e30, LLONG_MAX}, {0, 512000, 0, 0, 0, 128000, 0, 0, NAN, 0},
+    struct Rate {
+        int32_t mode, target, maximum, off;
     };
-    for (const Estimate& test : cases) {
-        EncodeParam param{};
-        param.nVideoRateMode = test.videoMode;
-        param.nVideoBitrate = test.video;
-        param.nVideoMaxBitrate = test.videoMax;
-        param.bNoVideo = test.noVideo;
-        param.nAudioRateMode = test.audioMode;
-        param.nAudioBitrate = test.audio;
-        param.nAudioMaxBitrate = test.audioMax;
-        param.bNoAudio = test.noAudio;
-        EXPECT_EQ(MCGetEstimateDiskSpaceEx(&param, test.seconds), test.bytes) << &test - cases;
+    constexpr Rate kVideo{0, 512000, 0, 0};
+    constexpr Rate kAudio{0, 128000, 0, 0};
+    constexpr Rate kNone{0, 0, 0, 0};
+    const struct {
+        Rate video, audio;
+        double seconds;
+        long long bytes;
+    } cases[] = {
+        {kVideo, kAudio, 60.0, 4800000},
+        {{0, 512000, 0, 1}, kAudio, 10.0, 160000},
+        {kVideo, {0, 128000, 0, 1}, 10.0, 640000},
+        {{1, 512000, 1000000, 0}, kNone, 8.0, 804800},
+        {kNone, {-1, 24, 24, 0}, 8.0, 23 / 8 * 8},            // 9 + 14: each quotient is cut by itself
+        {{1, 600000000, 0, 0}, kNone, 1.0, -23687091},        // 4 * 600000000 wraps to -1894967296
+        {{1, 0, 400000000, 0}, kNone, 1.0, -23687091},        // 6 * 400000000 wraps as well
+        {{0, INT_MAX, 0, 0}, {0, 1, 0, 0}, 1.0, INT_MIN / 8}, // and so does the sum
+        {kVideo, kAudio, 0.000001, 0},
+        {kVideo, kAudio, 0.00001, 0},
+        {kVideo, kAudio, 0.00002, 1},
+        {kVideo, kAudio, -5.0, 0},
+        {kVideo, kAudio, 1e30, LLONG_MAX},
+        {kVideo, kAudio, NAN, 0},
+    };
+    for (const auto& [video, audio, seconds, bytes] : cases) {
+        const EncodeParam param{
+            0,         0,         0, 0, 0,          0.0,          video.mode,    video.target, video.maximum,
+            0,         {},                                                       // pictures
+            0,         0,         0, 0, audio.mode, audio.target, audio.maximum, // sound
+            video.off, audio.off, 0};
+        EXPECT_EQ(MCGetEstimateDiskSpaceEx(&param, seconds), bytes) << video.target << " " << seconds;
     }
-    EXPECT_EQ(MCGetEstimateDiskSpaceEx(nullptr, 10.0), 0);
-}
-
-TEST(EstimateTest, FreeSpaceIsNotAsked) {
-    EXPECT_EQ(MCGetDiskFreeSpace(nullptr), 0);
-    EXPECT_EQ(MCGetDiskFreeSpace(L""), 0);
-    EXPECT_EQ(MCGetDiskFreeSpace(L"/no/such/place"), 4294967295LL);
 }
 
 /// The names of the clips of one conversion of `pictures` pictures, each a clip of its own.
@@ -277,47 +221,38 @@ TEST(ClipTest, NumbersGoOn) {
 TEST(ClipTest, WithoutSplittingThereAreNone) {
     for (const int mode : {0, 2, -1}) {
         ScriptedHost host;
-        host.hasAudio = false;
-        host.video.stamps = Stamps(0, kSecond / 10, 3);
+        host.SetMovie(3, 0);
         host.Create();
         MCSetSplitParam(host.handle, mode, 0);
-        EXPECT_EQ(host.Convert().rfind("create out.mp4 ", 0), 0U);
+        EXPECT_EQ(host.Convert().rfind("create out.mp4 ", 0), 0U) << mode;
         EXPECT_EQ(MCGetTargetCount(host.handle), 0);
     }
 }
 
-// A name that does not fit whole is not used: cut names would be the same for all clips.
+// A name that does not fit whole is not used: cut names would be the same for all clips. The number of the
+// hundredth clip takes one more character; the files before it are complete.
 TEST(ClipTest, NamesAreNeverCut) {
+    constexpr size_t kAll = 102;
     const std::wstring extension19 = L"." + std::wstring(18, L'e');
-    const auto named = [](const std::wstring& output) {
-        ScriptedHost host;
-        return ClipNames(host, output, 1).size();
+    const std::pair<std::wstring, size_t> cases[] = {
+        {std::wstring(503, L'x') + L".mp4", kAll},
+        {std::wstring(504, L'x') + L".mp4", 100},
+        {std::wstring(505, L'x') + L".mp4", 0},
+        {std::wstring(508, L'x'), 100},
+        {std::wstring(600, L'x'), 0},
+        {L"x" + extension19, kAll},
+        {L"x" + extension19 + L"e", 0},
     };
-    EXPECT_EQ(named(std::wstring(504, L'x') + L".mp4"), 1U);
-    EXPECT_EQ(named(std::wstring(505, L'x') + L".mp4"), 0U);
-    EXPECT_EQ(named(std::wstring(508, L'x')), 1U);
-    EXPECT_EQ(named(std::wstring(600, L'x')), 0U);
-    EXPECT_EQ(named(L"x" + extension19), 1U);
-    EXPECT_EQ(named(L"x" + extension19 + L"e"), 0U);
-
-    ScriptedHost host;
-    ClipNames(host, std::wstring(600, L'x'), 1);
-    EXPECT_EQ(TraceWithoutLog(), "event finished 3\nfinished 3 without record\n");
-    EXPECT_NE(LogLines().find("output name too long"), std::string::npos);
-}
-
-// The hundredth clip's number takes one more character than there is room for. The file before it is
-// complete.
-TEST(ClipTest, NameMayOutgrowItsRoomLater) {
-    ScriptedHost host;
-    const std::vector<std::wstring> names = ClipNames(host, std::wstring(508, L'x'), 102);
-    EXPECT_EQ(names.size(), 100U);
-    const std::string trace = TraceWithoutLog();
-    const std::string end =
-        "close #100\nimage 100000000\nclose #0 with callback and context\nevent finished 3\n"
-        "finished 3 without record\n";
-    ASSERT_GT(trace.size(), end.size());
-    EXPECT_EQ(trace.substr(trace.size() - end.size()), end);
+    for (const auto& [output, clips] : cases) {
+        SCOPED_TRACE(testing::Message() << output.size() << " characters");
+        ScriptedHost host;
+        EXPECT_EQ(ClipNames(host, output, kAll).size(), clips);
+        const std::string trace = TraceWithoutLog();
+        EXPECT_EQ(trace.find("event finished 3\nfinished 3 without record\n") != std::string::npos,
+                  clips < kAll);
+        EXPECT_EQ(trace.find("close #0 with callback and context\n") != std::string::npos, clips == 100);
+        EXPECT_EQ(LogLines().find("output name too long") != std::string::npos, clips < kAll);
+    }
 }
 
 } // namespace

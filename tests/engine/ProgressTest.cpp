@@ -3,7 +3,8 @@
 
 #include <gtest/gtest.h>
 
-#include <cstring>
+#include <iterator>
+#include <utility>
 
 namespace {
 
@@ -17,45 +18,57 @@ struct Estimate {
     double speed;
 };
 
-void ExpectEstimates(const ScriptedHost& host, const std::vector<Estimate>& estimates) {
-    for (const Estimate& expected : estimates) {
-        SCOPED_TRACE(expected.record);
-        ASSERT_LT(expected.record, host.records.size());
-        const ProgressInfo& record = host.records[expected.record];
-        EXPECT_EQ(Milliseconds(record.tElapsed), expected.elapsed);
-        EXPECT_EQ(Milliseconds(record.tRemaining), expected.remaining);
-        EXPECT_NEAR(record.dSpeed, expected.speed, 1e-9);
+TEST(PaceTest, EstimatesComeAtTheirTimes) {
+    struct Movie {
+        const char* name;
+        size_t pictures, blocks;
+        uint32_t pictureMs, blockMs; // of work for each
+        size_t records;
+    };
+    const std::pair<Movie, std::vector<Estimate>> cases[] = {
+        // Records come with pictures 1, 4, 7, ..., with the last picture and at the end; an estimate is made
+        // after 1 s, after 2 s, then every 2 s, and with each of the last pictures.
+        {{"pictures and sound", 100, 200, 200, 0, 35},
+         {{0, 200, 0, 0.0},      // picture 1
+          {1, 800, 0, 0.0},      // picture 4
+          {2, 1400, 19200, 0.5}, // picture 7: (100 - 4) pictures at 1000 ms for 5
+          {3, 2000, 18200, 0.5}, // picture 10: (100 - 9) at 1000 for 5
+          {4, 2600, 18200, 0.5},
+          {6, 3800, 18200, 0.5},
+          {7, 4400, 16200, 0.5}, // picture 22, estimated at 20: (100 - 19) at 2000 for 10
+          {33, 19800, 400, 0.5}, // picture 99: (100 - 98) at 200 for 1
+          {34, 20000, 0, 0.5}}},
+        // An estimate made with the very first pictures counts five of them: 100 at 1000 ms for 5.
+        {{"slow pictures and sound", 100, 1, 1000, 0, 35}, {{0, 1000, 20000, 0.5}}},
+        // 80 ms are enough, and the speed is looked at once a second. Every second picture is told.
+        {{"pictures", 41, 0, 50, 0, 21},
+         {{0, 100, 0, 0.0},
+          {8, 900, 0, 0.0},
+          {9, 1000, 1050, 2.0}, // (4.1 - 2.0) / 2
+          {18, 1900, 150, 2.0},
+          {20, 2050, 0, 2.0}}},
+        // Block 1 brings too few samples; blocks 31, 61 and 91 bring more than 1000 each.
+        {{"sound", 0, 100, 0, 100, 4},
+         {{0, 3200, 7800, 0.5}, // estimated with block 21: (5.0 - 1.1) / 0.5
+          {1, 6200, 3800, 0.5}, // with this very block
+          {2, 9200, 1800, 0.5}, // with block 81
+          {3, 10100, 0, 0.5}}},
+    };
+    for (const auto& [movie, estimates] : cases) {
+        ScriptedHost host;
+        host.SetMovie(movie.pictures, movie.blocks);
+        host.video.stepMs = movie.pictureMs;
+        host.audio.stepMs = movie.blockMs;
+        host.Convert();
+        ASSERT_EQ(host.records.size(), movie.records) << movie.name;
+        for (const Estimate& expected : estimates) {
+            SCOPED_TRACE(testing::Message() << movie.name << ", record " << expected.record);
+            const ProgressInfo& record = host.records.at(expected.record);
+            EXPECT_EQ(Milliseconds(record.tElapsed), expected.elapsed);
+            EXPECT_EQ(Milliseconds(record.tRemaining), expected.remaining);
+            EXPECT_NEAR(record.dSpeed, expected.speed, 1e-9);
+        }
     }
-}
-
-// 100 pictures at 10 a second, 200 ms of work for each. Records come with pictures 1, 4, 7, ...; an estimate
-// is made after 1 s, after 2 s, then every 2 s, and with each of the last pictures.
-TEST(PaceTest, AudioVideoEstimates) {
-    ScriptedHost host;
-    host.SetMovie(100, 200);
-    host.video.stepMs = 200;
-    host.Convert();
-    ExpectEstimates(host, {
-                              {0, 200, 0, 0.0},      // picture 1
-                              {1, 800, 0, 0.0},      // picture 4
-                              {2, 1400, 19200, 0.5}, // picture 7: (100 - 4) pictures at 1000 ms for 5
-                              {3, 2000, 18200, 0.5}, // picture 10: (100 - 9) at 1000 for 5
-                              {4, 2600, 18200, 0.5},
-                              {6, 3800, 18200, 0.5},
-                              {7, 4400, 16200, 0.5}, // picture 22, estimated at 20: (100 - 19) at 2000 for 10
-                          });
-    ASSERT_EQ(host.records.size(), 35U); // 33 by the interval, one with the last picture, one at the end
-    ExpectEstimates(host,
-                    {{33, 19800, 400, 0.5}, {34, 20000, 0, 0.5}}); // picture 99: (100 - 98) at 200 for 1
-}
-
-// An estimate made with the very first pictures counts five of them.
-TEST(PaceTest, FirstAudioVideoEstimateIsCautious) {
-    ScriptedHost host;
-    host.SetMovie(100, 1);
-    host.video.stepMs = 1000;
-    host.Convert();
-    ExpectEstimates(host, {{0, 1000, 20000, 0.5}}); // 100 pictures at 1000 ms for 5
 }
 
 TEST(PaceTest, AudioVideoIntervalGrowsWithTheLength) {
@@ -73,52 +86,16 @@ TEST(PaceTest, AudioVideoIntervalGrowsWithTheLength) {
     }
 }
 
-// 80 ms are enough, and the speed is looked at once a second.
-TEST(PaceTest, VideoEstimates) {
-    ScriptedHost host;
-    host.hasAudio = false;
-    host.SetMovie(41, 0);
-    host.video.stepMs = 50;
-    host.Convert();
-    ASSERT_EQ(host.records.size(), 21U); // every second picture
-    ExpectEstimates(host, {
-                              {0, 100, 0, 0.0},
-                              {8, 900, 0, 0.0},
-                              {9, 1000, 1050, 2.0}, // (4.1 - 2.0) / 2
-                              {18, 1900, 150, 2.0},
-                              {20, 2050, 0, 2.0}, // the final one
-                          });
-}
-
-TEST(PaceTest, AudioEstimates) {
-    ScriptedHost host;
-    host.hasVideo = false;
-    host.SetMovie(0, 100);
-    host.audio.stepMs = 100;
-    host.Convert();
-    // Block 1 brings too few samples; blocks 31, 61 and 91 bring more than 1000 each.
-    ASSERT_EQ(host.records.size(), 4U);
-    ExpectEstimates(host, {
-                              {0, 3200, 7800, 0.5}, // estimated with block 21: (5.0 - 1.1) / 0.5
-                              {1, 6200, 3800, 0.5}, // with this very block
-                              {2, 9200, 1800, 0.5}, // with block 81
-                              {3, 10100, 0, 0.5},   // the final one
-                          });
-}
-
-struct SampleCase {
-    int32_t bits, blockLength;
-    size_t told; // of 62 blocks
-};
-
 // Every thirtieth block is told of when more than 1000 samples have come since the last time.
 TEST(PaceTest, AudioIsPacedBySamples) {
-    for (const SampleCase& test : {SampleCase{8, 34, 2}, SampleCase{8, 33, 1}, SampleCase{8, 31, 1},
-                                   SampleCase{16, 68, 2}, SampleCase{16, 62, 1}, SampleCase{8, 501, 3},
-                                   SampleCase{8, 500, 2}, SampleCase{7, 5000, 0}, SampleCase{0, 5000, 0}}) {
+    const struct {
+        int32_t bits, blockLength;
+        size_t told; // of 62 blocks
+    } cases[] = {{8, 34, 2},  {8, 33, 1},  {8, 31, 1},   {16, 68, 2}, {16, 62, 1},
+                 {8, 501, 3}, {8, 500, 2}, {7, 5000, 0}, {0, 5000, 0}};
+    for (const auto& test : cases) {
         ScriptedHost host;
-        host.hasVideo = false;
-        host.audio.stamps = Stamps(0, 1, 62);
+        host.SetMovie(0, 62);
         host.audio.blockLength = test.blockLength;
         host.audio.Format().nBitsPerSample = test.bits;
         host.Convert();
@@ -140,54 +117,49 @@ TEST(RecordTest, PreviewMayBeSwitchedWhileRunning) {
         EXPECT_EQ(host.records[i].pPreviewImage != nullptr, i % 2 == 0);
 }
 
-// Copies differ from the decoder's records by their stamps only, and both stamps of a picture move alike.
+// The writer gets the decoder's records with other stamps, and those of sound alone as they are.
 TEST(RecordTest, StampsAloneAreChanged) {
-    ScriptedHost host;
-    host.video.stamps = {3000000, 4000000};
-    host.audio.stamps = {3200000, 3700000, 4200000};
-    host.Convert();
-    const auto pictures = recorder::Pictures();
-    const auto sounds = recorder::Sounds();
-    ASSERT_EQ(pictures.size(), 2U);
-    ASSERT_EQ(sounds.size(), 3U);
-    for (size_t i = 0; i < 2; ++i) {
-        VideoImage expected = *host.video.Image(i);
-        expected.llTime -= 3000000;
-        expected.llTime2 -= 3000000;
-        EXPECT_EQ(std::memcmp(&pictures[i], &expected, sizeof expected), 0);
+    using Stamped = std::vector<std::pair<int64_t, int64_t>>; // llTime2 and llTime of each
+    const struct {
+        const char* name;
+        std::vector<int64_t> pictures, blocks;
+        unsigned long clipMs;
+        Stamped writtenPictures, writtenBlocks;
+    } cases[] = {
+        {"pictures and sound",
+         {3000000, 4000000},
+         {3200000, 3700000, 4200000},
+         60000,
+         {{7, 0}, {1000007, 1000000}},
+         {{200000, 200000}, {700000, 700000}, {1200000, 1200000}}},
+        {"pictures, a clip each", {1000, 2000, 5000}, {}, 0, {{1007, 1000}, {1000, 1000}, {3000, 3000}}, {}},
+        {"sound", {}, {5, 5, -9}, 60000, {}, {{8, 5}, {8, 5}, {-6, -9}}},
+    };
+    for (const auto& test : cases) {
+        SCOPED_TRACE(test.name);
+        ScriptedHost host;
+        host.hasVideo = !test.pictures.empty();
+        host.hasAudio = !test.blocks.empty();
+        host.video.stamps = test.pictures;
+        host.audio.stamps = test.blocks;
+        host.Split(test.clipMs);
+        host.Convert();
+        const recorder::Recording written = recorder::Recorded();
+        ASSERT_EQ(written.pictures.size(), test.writtenPictures.size());
+        ASSERT_EQ(written.sounds.size(), test.writtenBlocks.size());
+        for (size_t i = 0; i < written.pictures.size(); ++i) {
+            VideoImage expected = host.video.Image(i);
+            expected.llTime2 = test.writtenPictures[i].first;
+            expected.llTime = test.writtenPictures[i].second;
+            EXPECT_TRUE(SameBytes(written.pictures[i], expected)) << i;
+        }
+        for (size_t i = 0; i < written.sounds.size(); ++i) {
+            AudioFrame expected = host.audio.Block(i);
+            expected.llTime2 = test.writtenBlocks[i].first;
+            expected.llTime = test.writtenBlocks[i].second;
+            EXPECT_TRUE(SameBytes(written.sounds[i], expected)) << i;
+        }
     }
-    for (size_t i = 0; i < 3; ++i) {
-        AudioFrame expected = host.audio.Block(i);
-        expected.llTime = expected.llTime2 = 200000 + static_cast<int64_t>(i) * 500000;
-        EXPECT_EQ(std::memcmp(&sounds[i], &expected, sizeof expected), 0);
-    }
-}
-
-TEST(RecordTest, SoundAloneIsHandedOnUnchanged) {
-    ScriptedHost host;
-    host.hasVideo = false;
-    host.audio.stamps = {5, 5, -9};
-    host.Convert();
-    const auto sounds = recorder::Sounds();
-    ASSERT_EQ(sounds.size(), 3U);
-    for (size_t i = 0; i < 3; ++i) {
-        const AudioFrame expected = host.audio.Block(i);
-        EXPECT_EQ(std::memcmp(&sounds[i], &expected, sizeof expected), 0);
-    }
-}
-
-TEST(RecordTest, ClipsOfPicturesMoveBothStamps) {
-    ScriptedHost host;
-    host.hasAudio = false;
-    host.video.stamps = {1000, 2000, 5000};
-    host.Split(0);
-    host.Convert();
-    const auto pictures = recorder::Pictures();
-    ASSERT_EQ(pictures.size(), 3U);
-    EXPECT_EQ(+pictures[0].llTime2, 1007);
-    EXPECT_EQ(+pictures[1].llTime2, 1000);
-    EXPECT_EQ(+pictures[2].llTime2, 3000);
-    EXPECT_EQ(pictures[2].nDuration, 2);
 }
 
 TEST(RecordTest, SilenceIsOfTheOutputsFormat) {
@@ -200,22 +172,17 @@ TEST(RecordTest, SilenceIsOfTheOutputsFormat) {
         param.nBitsPerSample = 24;
     });
     host.Convert();
-    const auto sounds = recorder::Sounds();
-    ASSERT_EQ(sounds.size(), 3U);
-    AudioFrame expected{};
-    expected.nType = 3;
-    expected.nSampleRate = 44100;
-    expected.nChannels = 3;
-    expected.nBitsPerSample = 24;
-    expected.pData = sounds[0].pData;
-    expected.nBufferSize = 1048576;
-    const int64_t steps[] = {400000, 400000, 200001};
-    expected.llTime = expected.llTime2 = -1;
-    for (size_t i = 0; i < 3; ++i) {
-        expected.nLength = i < 2 ? 15876 : 7938;
-        expected.nDuration = static_cast<int32_t>(steps[i]);
-        EXPECT_EQ(std::memcmp(&sounds[i], &expected, sizeof expected), 0) << i;
-        expected.llTime = expected.llTime2 += steps[i];
+    const std::vector<AudioFrame> sounds = recorder::Recorded().sounds;
+    const struct {
+        int64_t time;
+        int32_t length, duration;
+    } blocks[] = {{-1, 15876, 400000}, {399999, 15876, 400000}, {799999, 7938, 200001}};
+    ASSERT_EQ(sounds.size(), std::size(blocks));
+    for (size_t i = 0; i < sounds.size(); ++i) {
+        const auto& [time, length, duration] = blocks[i];
+        const AudioFrame expected{3,       44100, 3,    24,   sounds[0].pData, length,
+                                  1048576, {},    time, time, duration};
+        EXPECT_TRUE(SameBytes(sounds[i], expected)) << i;
     }
 }
 

@@ -1,25 +1,16 @@
 #include "tests/engine/ScriptedHost.h"
 
+#include <atomic>
 #include <cmath>
-#include <cstdarg>
-#include <cstdio>
-#include <sstream>
 
 #include <sys/times.h>
 
 namespace {
 
-std::atomic<uint32_t> g_ticks{0}; // what the engine reads as its clock, 10 ms each
+using recorder::Line;
+using recorder::Note;
 
-__attribute__((format(printf, 1, 2))) void Note(const char* format, ...) {
-    char line[256];
-    va_list arguments;
-    va_start(arguments, format);
-    // The analyser does not see va_start here.
-    vsnprintf(line, sizeof line, format, arguments); // NOLINT(clang-analyzer-valist.Uninitialized)
-    va_end(arguments);
-    recorder::Note(line);
-}
+std::atomic<uint32_t> g_ticks{0}; // what the engine reads as its clock, 10 ms each
 
 UInt32 Parameter(EventRef event, EventParamName name) {
     UInt32 value = 0xDEADBEEF;
@@ -27,33 +18,28 @@ UInt32 Parameter(EventRef event, EventParamName name) {
     return value;
 }
 
-std::string Figure(const char* name, double value) {
-    char text[64];
-    snprintf(text, sizeof text, " %s %g", name, value);
-    return text;
-}
-
 /// A record without what is as usual.
 std::string Describe(const ProgressInfo* info) {
     if (!info)
         return " without record";
-    std::string text = Figure("at", info->dPosition);
+    std::string text = Line(" at %g", info->dPosition);
     if (std::abs(info->dDoneLength - info->dPosition) > 1e-9)
-        text += Figure("done", info->dDoneLength);
+        text += Line(" done %g", info->dDoneLength);
     if (info->dSpeed != 0.0)
-        text += Figure("speed", info->dSpeed);
+        text += Line(" speed %g", info->dSpeed);
     if (info->nPercent != info->nProgress / 100)
-        text += Figure("percent", info->nPercent);
+        text += Line(" percent %d", info->nPercent);
     if (info->pPreviewImage)
         text += " preview " + std::to_string(info->pPreviewImage->llTime);
     return text;
 }
 
-std::string Filter(bool logLines) {
+/// The lines of the trace that the log sink wrote, or the others, or both.
+std::string Lines(bool ofLog, bool others) {
     std::string lines;
-    for (const std::string& line : recorder::Trace())
-        if ((line.rfind("log ", 0) == 0) == logLines)
-            lines += (logLines ? line.substr(4) : line) + "\n";
+    for (const std::string& line : recorder::Recorded().trace)
+        if (line.rfind("log ", 0) == 0 ? ofLog : others)
+            lines += line + "\n";
     return lines;
 }
 
@@ -78,7 +64,7 @@ OSStatus PostEventToQueue(EventQueueRef queue, EventRef event, EventPriority pri
     line += " " + std::to_string(static_cast<int32_t>(Parameter(event, 0x4C50414D)));
     if (window != 0)
         line += " for window " + std::to_string(window);
-    recorder::Note(usual ? line : line + " unusual");
+    Note(usual ? line : line + " unusual");
     return noErr;
 }
 
@@ -87,46 +73,43 @@ ScriptedVideo::ScriptedVideo() {
 }
 
 double ScriptedVideo::Seek(double seconds, int mode) {
-    Note("seek video %g %d", seconds, mode);
+    Note(Line("seek video %g %d", seconds, mode));
     return seconds;
 }
 
+VideoImage ScriptedVideo::Image(size_t index) const {
+    VideoImage image{};
+    image.nType = kMediaTypePicture;
+    image.llTime2 = stamps[index] + 7;
+    image.llTime = stamps[index];
+    image.nDuration = static_cast<int32_t>(index);
+    return image;
+}
+
+VideoImage* ScriptedVideo::Load() {
+    images.resize(stamps.size());
+    VideoImage& image = images[overwrites ? 0 : position];
+    image = Image(position);
+    return &image;
+}
+
 VideoImage* ScriptedVideo::GetCurrentImage() {
-    if (images.empty()) {
-        images.resize(stamps.size());
-        for (size_t i = 0; i < stamps.size(); ++i) {
-            images[i].nType = kMediaTypePicture;
-            images[i].nDuration = static_cast<int32_t>(i);
-            images[i].llTime = stamps[i];
-            images[i].llTime2 = stamps[i] + 7;
-        }
-    }
-    if (position >= images.size()) {
-        Note("image none");
-        return nullptr;
-    }
-    Note("image %lld", static_cast<long long>(stamps[position]));
-    if (overwrites) {
-        images[0].llTime = stamps[position];
-        images[0].llTime2 = stamps[position] + 7;
-        return images.data();
-    }
-    return &images[position];
+    const bool none = position >= stamps.size();
+    Note("image " + (none ? "none" : std::to_string(stamps[position])));
+    return none ? nullptr : Load();
 }
 
 int ScriptedVideo::DecodeNext(int mode) {
     const bool atEnd = position + 1 >= stamps.size();
     if (!atEnd || !staysAtLast)
         ++position;
-    if (overwrites && !atEnd) {
-        images[0].llTime = stamps[position];
-        images[0].llTime2 = stamps[position] + 7;
-    }
+    if (overwrites && !atEnd)
+        Load();
     AdvanceClock(stepMs);
     if (onNext)
         onNext(position);
     const int result = atEnd && announcesEnd ? 0 : mode;
-    Note("next -> %d", result);
+    Note(Line("next -> %d", result));
     return result;
 }
 
@@ -135,7 +118,7 @@ ScriptedAudio::ScriptedAudio() {
 }
 
 double ScriptedAudio::Seek(double seconds) {
-    Note("seek audio %g", seconds);
+    Note(Line("seek audio %g", seconds));
     return seconds;
 }
 
@@ -156,15 +139,13 @@ AudioFrame ScriptedAudio::Block(size_t index) const {
 
 AudioFrame* ScriptedAudio::GetNextFrame() {
     AdvanceClock(stepMs);
-    if (onBlock)
-        onBlock(position);
     if (position >= stamps.size()) {
         Note("block none");
         block = {};
         return endsEmpty ? &block : nullptr;
     }
     block = Block(position++);
-    Note("block %lld", static_cast<long long>(block.llTime));
+    Note("block " + std::to_string(block.llTime));
     return &block;
 }
 
@@ -188,13 +169,14 @@ void ScriptedHost::SetMovie(size_t pictures, size_t blocks) {
 }
 
 void ScriptedHost::Create() {
+    if (handle)
+        return;
     handle = MCCreate(hasVideo ? &video : nullptr, hasAudio ? &audio : nullptr);
     MCSetOutputFile(handle, L"out.mp4");
 }
 
 void ScriptedHost::Change(const std::function<void(EncodeParam&)>& change) {
-    if (!handle)
-        Create();
+    Create();
     EncodeParam param;
     MCGetEncodeParam(handle, &param);
     change(param);
@@ -202,20 +184,18 @@ void ScriptedHost::Change(const std::function<void(EncodeParam&)>& change) {
 }
 
 void ScriptedHost::Split(unsigned long milliseconds) {
-    if (!handle)
-        Create();
+    Create();
     MCSetSplitParam(handle, 1, milliseconds);
 }
 
 int ScriptedHost::Start(double begin, double length) {
-    if (!handle)
-        Create();
+    Create();
     return MCStart(handle, begin, length, window, hasCallback ? Callback : nullptr, this);
 }
 
 std::string ScriptedHost::Convert(double begin, double length) {
     if (const int result = Start(begin, length); result != 0)
-        Note("start -> %d", result);
+        Note(Line("start -> %d", result));
     MCWait(handle, MC_INFINITE);
     return TraceWithoutLog();
 }
@@ -227,22 +207,18 @@ unsigned ScriptedHost::Callback(void* context, unsigned kind, unsigned value, ui
         host.records.push_back(*info);
     const std::string name = kind == 1 ? "finished " : "progress ";
     const bool usual = kind == 1 || !info || info->nProgress == static_cast<int>(value);
-    recorder::Note(name + std::to_string(static_cast<int>(value)) + Describe(info) +
-                   (usual ? "" : " unusual"));
+    Note(name + std::to_string(static_cast<int>(value)) + Describe(info) + (usual ? "" : " unusual"));
     if (host.onCallback)
         host.onCallback(kind, info);
-    return kind == 0 && ++host.progressCalls == host.cancelAt ? 0 : 1;
+    return kind == 0 && host.records.size() == host.cancelAt ? 0 : 1;
 }
 
 std::string LogLines() {
-    return Filter(true);
+    return Lines(true, false);
 }
 std::string TraceWithoutLog() {
-    return Filter(false);
+    return Lines(false, true);
 }
 std::string WholeTrace() {
-    std::string lines;
-    for (const std::string& line : recorder::Trace())
-        lines += line + "\n";
-    return lines;
+    return Lines(true, true);
 }

@@ -7,7 +7,7 @@
 #include "api/MovieConv.h"
 #include "tests/recorder/RecordingWriter.h"
 
-#include <atomic>
+#include <climits>
 #include <functional>
 #include <string>
 #include <vector>
@@ -23,22 +23,30 @@ void AdvanceClock(uint32_t ms);
 ///     seek video SECONDS MODE
 ///     image STAMP, or image none
 ///     next -> RESULT
+/// and "reserved" for an operation that must never be called, as ScriptedAudio does.
 class ScriptedVideo : public VideoDecoder {
 public:
     ScriptedVideo();
 
-    VideoSourceInfo* GetVideoInfo() override { return opens ? &info : nullptr; }
+    VideoSourceInfo* GetVideoInfo() override { return descriptions-- > 0 ? &info : nullptr; }
     double Seek(double seconds, int mode) override;
     VideoImage* GetCurrentImage() override;
     int DecodeNext(int mode) override;
 
+    void Reserved0() override { recorder::Note("reserved"); }
+    void Reserved1() override { recorder::Note("reserved"); }
+    void Reserved2() override { recorder::Note("reserved"); }
+    void Reserved3() override { recorder::Note("reserved"); }
+    void Reserved4() override { recorder::Note("reserved"); }
+    void Reserved7() override { recorder::Note("reserved"); }
+
     VideoFormat& Format() { return info.format; }
 
-    /// The record of picture `index`, once a conversion has begun.
-    const VideoImage* Image(size_t index) const { return &images[index]; }
+    /// Picture `index` as it is handed out.
+    VideoImage Image(size_t index) const;
 
     std::vector<int64_t> stamps;
-    bool opens = true;                  // false: there is no description
+    int descriptions = INT_MAX;         // so many calls find one, later ones none
     bool staysAtLast = false;           // goes on handing out the last picture after the end
     bool announcesEnd = true;           // DecodeNext tells the end; otherwise the picture is missing
     bool overwrites = false;            // one record for all pictures; otherwise each has its own
@@ -46,6 +54,9 @@ public:
     std::function<void(size_t)> onNext; // told the number of pictures done
 
 private:
+    /// Fills the record of the current picture.
+    VideoImage* Load();
+
     VideoSourceInfo info{};
     std::vector<VideoImage> images;
     size_t position = 0;
@@ -59,9 +70,15 @@ public:
     /// Sound of 1000 bytes a second: 1000 Hz, one channel, 8 bits.
     ScriptedAudio();
 
-    AudioSourceInfo* GetAudioInfo() override { return opens ? &info : nullptr; }
+    AudioSourceInfo* GetAudioInfo() override { return descriptions-- > 0 ? &info : nullptr; }
     double Seek(double seconds) override;
     AudioFrame* GetNextFrame() override;
+
+    void Reserved0() override { recorder::Note("reserved"); }
+    void Reserved1() override { recorder::Note("reserved"); }
+    void Reserved2() override { recorder::Note("reserved"); }
+    void Reserved3() override { recorder::Note("reserved"); }
+    void Reserved6() override { recorder::Note("reserved"); }
 
     AudioFormat& Format() { return info.format; }
 
@@ -70,10 +87,9 @@ public:
 
     std::vector<int64_t> stamps;
     int32_t blockLength = 50;
-    bool opens = true;
-    bool endsEmpty = false;              // the end is an empty block, not null
-    uint32_t stepMs = 0;                 // what the clock advances at each block
-    std::function<void(size_t)> onBlock; // told the number of blocks done
+    int descriptions = INT_MAX;
+    bool endsEmpty = false; // the end is an empty block, not null
+    uint32_t stepMs = 0;    // what the clock advances at each block
 
 private:
     AudioSourceInfo info{};
@@ -100,16 +116,17 @@ public:
     /// As many pictures and blocks, 10 and 20 a second, each stream as long as that makes it.
     void SetMovie(size_t pictures, size_t blocks);
 
-    /// Makes the converter over the decoders that are wanted, with the output "out.mp4".
+    /// Makes the converter unless it exists, as all of the following do, over the decoders that are wanted,
+    /// with the output "out.mp4".
     void Create();
 
-    /// Creates the converter unless it exists, and changes its parameters.
+    /// Changes the parameters.
     void Change(const std::function<void(EncodeParam&)>& change);
 
-    /// Creates the converter unless it exists, and splits the output into clips of that length.
+    /// Splits the output into clips of that length.
     void Split(unsigned long milliseconds);
 
-    /// Creates the converter unless it exists, and starts it with the callback.
+    /// Starts with the callback.
     int Start(double begin = 0.0, double length = 0.0);
 
     /// Starts, waits for the end and returns the trace without log lines. Notes a failure to start:
@@ -129,9 +146,6 @@ public:
     MCHandle handle = nullptr;
 
     std::vector<ProgressInfo> records; // of the progress calls
-
-private:
-    unsigned progressCalls = 0;
 };
 
 /// The log lines of the trace, everything else, or all of it, a line each.

@@ -52,13 +52,6 @@ Setting Into(ScriptedHost& host, int32_t EncodeParam::*field) {
     };
 }
 
-void AbortInCallback(ScriptedHost& host) {
-    host.onCallback = [&host](unsigned kind, const ProgressInfo*) {
-        if (kind == 0)
-            MCAbort(host.handle);
-    };
-}
-
 void AbortAfterPicture(ScriptedHost& host, size_t last) {
     host.video.onNext = [&host, last](size_t done) {
         if (done == last)
@@ -91,7 +84,7 @@ std::map<std::string, Setting> Settings(Script& script) {
         {"has-video", Into(host.hasVideo)},
         {"has-audio", Into(host.hasAudio)},
         {"has-callback", Into(host.hasCallback)},
-        {"video-opens", Into(host.video.opens)},
+        {"video-descriptions", Into(host.video.descriptions)},
         {"video-stays-at-last", Into(host.video.staysAtLast)},
         {"video-announces-end", Into(host.video.announcesEnd)},
         {"video-reuses-its-record", Into(host.video.overwrites)},
@@ -100,9 +93,9 @@ std::map<std::string, Setting> Settings(Script& script) {
         {"length", Into(script.length)},
         {"window", [&](std::istream&) { host.window = reinterpret_cast<OpaqueWindowPtr*>(0x1234); }},
         {"cancel-at-call", Into(host.cancelAt)},
-        {"abort-in-callback", [&](std::istream&) { AbortInCallback(host); }},
         {"abort-after-pictures", [&](std::istream& words) { AbortAfterPicture(host, Next<size_t>(words)); }},
-        {"failing-creates", [](std::istream& words) { recorder::FailCreates(Rest<std::set<int>>(words)); }},
+        {"failing-creates",
+         [](std::istream& words) { recorder::Reset({.failingCreates = Rest<std::set<int>>(words)}); }},
         {"split-ms", [&](std::istream& words) { host.Split(Next<unsigned long>(words)); }},
         {"video-bitrate", Into(host, &EncodeParam::nVideoBitrate)},
         {"output-sample-rate", Into(host, &EncodeParam::nSampleRate)},

@@ -12,7 +12,7 @@ namespace {
 constexpr QueueSides kSides{L"A waits for room", L"B waits for items", std::chrono::milliseconds(20)};
 
 int Lines(const std::string& beginning) {
-    const std::vector<std::string> trace = recorder::Trace();
+    const std::vector<std::string> trace = recorder::Recorded().trace;
     return static_cast<int>(std::count_if(trace.begin(), trace.end(), [&](const std::string& line) {
         return line.rfind("log " + beginning, 0) == 0;
     }));

@@ -81,9 +81,7 @@ std::vector<State> States() {
 class StopFrom : public testing::TestWithParam<State> {
 protected:
     StopFrom() {
-        recorder::Reset();
-        recorder::OnWrite([] { g_write.Pass(); });
-        recorder::OnClose([] { g_close.Pass(); });
+        recorder::Reset({.onWrite = [] { g_write.Pass(); }, .onClose = [] { g_close.Pass(); }});
     }
     ~StopFrom() override {
         recorder::Reset();

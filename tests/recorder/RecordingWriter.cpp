@@ -3,37 +3,17 @@
 #include "media/MediaWriter.h"
 
 #include <algorithm>
-#include <cstdio>
+#include <cstdint>
 #include <mutex>
 #include <utility>
 
 namespace {
 
-struct State {
-    std::vector<std::string> trace;
-    std::vector<AudioFrame> sounds;
-    std::vector<VideoImage> pictures;
-    std::vector<EncodeParam> params;
-    std::set<int> failing;
-    const FileFormatInfo* formats = nullptr;
-    std::function<void()> onWrite;
-    std::function<void()> onClose;
-};
+using recorder::Line;
 
 std::mutex g_mutex;
-State g_state;
-
-template <class Value>
-Value Get(Value State::*member) {
-    const std::lock_guard guard(g_mutex);
-    return g_state.*member;
-}
-
-template <class Value>
-void Set(Value State::*member, Value value) {
-    const std::lock_guard guard(g_mutex);
-    g_state.*member = std::move(value);
-}
+recorder::Recording g_recording;
+recorder::Behaviour g_behaviour;
 
 /// Whether a block is the engine's silence. Of a long one only the first 64 KiB are looked at.
 bool IsSilence(const AudioFrame& frame) {
@@ -50,119 +30,87 @@ std::string Ascii(const wchar_t* text) {
     return ascii;
 }
 
-template <class... Values>
-std::string Format(const char* format, Values... values) {
-    char text[256];
-    snprintf(text, sizeof text, format, values...);
-    return text;
-}
-
-// A handle is the address of one of these, so that a file is known by its number.
-struct File {
-    int number;
-};
-
+/// The number of a file, which is its handle.
 int Number(const void* file) {
-    return file ? static_cast<const File*>(file)->number : 0;
+    return static_cast<int>(reinterpret_cast<intptr_t>(file));
 }
 
 /// Calls a hook with nothing locked, since it may take its time.
-void Call(std::function<void()> State::*member) {
-    if (const auto hook = Get(member))
+void Call(std::function<void()> recorder::Behaviour::*member) {
+    std::unique_lock guard(g_mutex);
+    const auto hook = g_behaviour.*member;
+    guard.unlock();
+    if (hook)
         hook();
+}
+
+/// Records a write to `file`. What the media writer returns.
+template <class Record>
+int Write(const void* file, std::vector<Record> recorder::Recording::*records, const Record& record,
+          const std::string& line) {
+    Call(&recorder::Behaviour::onWrite);
+    recorder::Note(line);
+    const std::lock_guard guard(g_mutex);
+    (g_recording.*records).push_back(record);
+    return file != nullptr;
 }
 
 } // namespace
 
-namespace recorder {
-
-void Reset() {
+void recorder::Reset(Behaviour behaviour) {
     const std::lock_guard guard(g_mutex);
-    g_state = State();
+    g_recording = {};
+    g_behaviour = std::move(behaviour);
 }
 
-void Note(std::string_view line) {
+void recorder::Note(std::string_view line) {
     const std::lock_guard guard(g_mutex);
-    g_state.trace.emplace_back(line);
+    g_recording.trace.emplace_back(line);
 }
 
-std::vector<std::string> Trace() {
-    return Get(&State::trace);
+recorder::Recording recorder::Recorded() {
+    const std::lock_guard guard(g_mutex);
+    return g_recording;
 }
-
-std::vector<AudioFrame> Sounds() {
-    return Get(&State::sounds);
-}
-
-std::vector<VideoImage> Pictures() {
-    return Get(&State::pictures);
-}
-
-std::vector<EncodeParam> Params() {
-    return Get(&State::params);
-}
-
-void FailCreates(std::set<int> numbers) {
-    Set(&State::failing, std::move(numbers));
-}
-
-void SetFormatTable(const FileFormatInfo* table) {
-    Set(&State::formats, table);
-}
-
-void OnWrite(std::function<void()> hook) {
-    Set(&State::onWrite, std::move(hook));
-}
-
-void OnClose(std::function<void()> hook) {
-    Set(&State::onClose, std::move(hook));
-}
-
-} // namespace recorder
 
 const FileFormatInfo* MWGetFileFormatInfos() {
-    return Get(&State::formats);
+    const std::lock_guard guard(g_mutex);
+    return g_behaviour.formats;
 }
 
 void* MWCreateMediaFile(const wchar_t* fileName, const EncodeParam* param, const VideoFormat* video,
                         const AudioFormat* audio) {
     const std::lock_guard guard(g_mutex);
-    g_state.params.push_back(*param);
-    const int number = static_cast<int>(g_state.params.size());
+    g_recording.params.push_back(*param);
+    const auto number = static_cast<intptr_t>(g_recording.params.size());
+    const bool fails = g_behaviour.failingCreates.count(static_cast<int>(number)) > 0;
     std::string line = "create " + Ascii(fileName);
-    line += video ? Format(" %dx%d@%g", video->nWidth, video->nHeight, video->dFrameRate) : " -";
-    line += audio ? Format(" %d/%d", audio->nSampleRate, audio->nChannels) : " -";
-    const bool fails = g_state.failing.count(number) > 0;
-    g_state.trace.push_back(line + (fails ? " -> null" : Format(" -> #%d", number)));
-    return fails ? nullptr : new File{number};
+    line += video ? Line(" %dx%d@%g", video->nWidth, video->nHeight, video->dFrameRate) : " -";
+    line += audio ? Line(" %d/%d", audio->nSampleRate, audio->nChannels) : " -";
+    line += fails ? " -> null" : " -> #" + std::to_string(number);
+    g_recording.trace.push_back(line);
+    return fails ? nullptr : reinterpret_cast<void*>(number);
 }
 
 int MWWriteVideoFrame(void* file, const VideoImage* image) {
-    Call(&State::onWrite);
-    const std::lock_guard guard(g_mutex);
-    g_state.pictures.push_back(*image);
-    g_state.trace.push_back(Format("picture #%d %lld", Number(file), static_cast<long long>(image->llTime)));
-    return file != nullptr;
+    return Write(file, &recorder::Recording::pictures, *image,
+                 Line("picture #%d %lld", Number(file), static_cast<long long>(image->llTime)));
 }
 
 int MWWriteAudioData(void* file, const AudioFrame* frame) {
-    Call(&State::onWrite);
-    const std::lock_guard guard(g_mutex);
-    g_state.sounds.push_back(*frame);
-    g_state.trace.push_back(Format("%s #%d %lld +%d", IsSilence(*frame) ? "silence" : "sound", Number(file),
-                                   static_cast<long long>(frame->llTime), frame->nLength));
-    return file != nullptr;
+    return Write(file, &recorder::Recording::sounds, *frame,
+                 Line("%s #%d %lld +%d", IsSilence(*frame) ? "silence" : "sound", Number(file),
+                      static_cast<long long>(frame->llTime), frame->nLength));
 }
 
 int MWCloseMediaFile(void* file, ProgressCallback callback, void* context) {
     if (callback)
-        Call(&State::onClose);
-    std::string line = Format("close #%d", Number(file));
+        Call(&recorder::Behaviour::onClose);
+    std::string line = Line("close #%d", Number(file));
     if (callback)
         line += context ? " with callback and context" : " with callback";
     else if (context)
         line += " with context";
     recorder::Note(line);
-    delete static_cast<File*>(file);
     return file != nullptr;
 }

@@ -10,8 +10,8 @@
 #include "media/EncodeParam.h"
 #include "media/MediaRecords.h"
 
-#include <cstddef>
-#include <cstdint>
+#include <cstdio>
+#include <cstring>
 #include <functional>
 #include <set>
 #include <string>
@@ -22,39 +22,51 @@
 
 namespace recorder {
 
-/// Forgets all recordings and everything that was set below.
-void Reset();
+struct Recording {
+    /// Lines as
+    ///
+    ///     create NAME WxH@RATE RATE/CHANNELS -> #FILE     formats that are null are "-", a failure is "->
+    ///     null" sound #FILE STAMP +BYTES                        "silence" for the engine's own, which is all
+    ///     zeros picture #FILE STAMP close #FILE, or close #FILE with callback
+    std::vector<std::string> trace;
+
+    std::vector<AudioFrame> sounds;   ///< The records of the writes.
+    std::vector<VideoImage> pictures; ///< The same.
+    std::vector<EncodeParam> params;  ///< The parameters of the creates.
+};
+
+struct Behaviour {
+    std::set<int> failingCreates = {};       ///< Their numbers, from 1.
+    const FileFormatInfo* formats = nullptr; ///< What MWGetFileFormatInfos gives out; stays the caller's.
+    std::function<void()> onWrite = {};      ///< Called in every write before it is noted.
+    std::function<void()> onClose = {};      ///< Called in every final close, one with a callback.
+};
+
+/// Forgets all recordings, and behaves like this from now on.
+void Reset(Behaviour behaviour = {});
 
 /// Adds a line to the trace.
 void Note(std::string_view line);
 
-/// The trace since Reset:
-///
-///     create NAME WxH@RATE RATE/CHANNELS -> #FILE     formats that are null are "-", a failure is "-> null"
-///     sound #FILE STAMP +BYTES                        "silence" for the engine's own, which is all zeros
-///     picture #FILE STAMP
-///     close #FILE, or close #FILE with callback
-std::vector<std::string> Trace();
+/// Everything since Reset.
+Recording Recorded();
 
-/// The records of the writes since Reset.
-std::vector<AudioFrame> Sounds();
-std::vector<VideoImage> Pictures();
-
-/// The parameters of the creates since Reset.
-std::vector<EncodeParam> Params();
-
-/// Makes the creates with these numbers, from 1, fail.
-void FailCreates(std::set<int> numbers);
-
-/// What MWGetFileFormatInfos gives out; null at first. The table stays the caller's.
-void SetFormatTable(const FileFormatInfo* table);
-
-/// Called in every write before it is noted, and in every final close, one with a callback.
-void OnWrite(std::function<void()> hook);
-void OnClose(std::function<void()> hook);
+/// A line, as printf makes it.
+template <class... Values>
+std::string Line(const char* format, Values... values) {
+    char text[256];
+    snprintf(text, sizeof text, format, values...);
+    return text;
+}
 
 } // namespace recorder
 
 #pragma GCC visibility pop
+
+/// Whether two records hold the same bytes.
+template <class Record>
+bool SameBytes(const Record& one, const Record& other) {
+    return std::memcmp(&one, &other, sizeof one) == 0;
+}
 
 #endif

@@ -81,7 +81,7 @@ std::vector<Clip> Convert(const Source& source) {
     const std::vector<int64_t> blocks = source.BlockTimes();
     size_t picture = 0;
     size_t block = 0;
-    for (const std::string& line : recorder::Trace()) {
+    for (const std::string& line : recorder::Recorded().trace) {
         long long stamp = 0;
         long long bytes = 0;
         if (line.rfind("create ", 0) == 0)
