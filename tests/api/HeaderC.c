@@ -16,17 +16,12 @@ static int SizesDiffer(void) {
 }
 
 int main(void) {
-    EncodeParam param = {0};
     EventRef event = NULL;
     double position = 0.0;
-    wchar_t name[MC_MAX_TARGET_NAME];
-    param.nAudioBitrate = 128000;
-    if (MCGetEstimateDiskSpaceEx(&param, 10.0) != 160000 || MCGetDiskFreeSpace(L"/") != 4294967295LL)
-        return 1;
-    if (MCCreate(NULL, NULL) || MCStart(NULL, 0.0, 0.0, NULL, Callback, &position) != -1)
+    if (MCStart(NULL, 0.0, 0.0, NULL, Callback, &position) != -1)
         return 2;
     if (CreateEvent(NULL, 5000, 42, 0.0, 0, &event) != noErr || GetEventKind(event) != 42)
         return 3;
     ReleaseEvent(event);
-    return SizesDiffer() || MCGetTargetFileName(NULL, name, 0);
+    return SizesDiffer();
 }

@@ -56,6 +56,8 @@ TEST(NullTest, NullHandlesDoNothing) {
     EXPECT_EQ(MCGetTargetCount(nullptr), 0);
     EXPECT_EQ(MCGetTargetFileName(nullptr, name, 0), 0);
     EXPECT_EQ(MCGetEstimateDiskSpace(nullptr), 0);
+    EXPECT_EQ(MCGetEstimateDiskSpaceEx(nullptr, 10.0), 0);
+    EXPECT_EQ(MCGetDiskFreeSpace(nullptr), 0);
     EXPECT_EQ(MCSetThreadPriority(nullptr, 7), 0);
 }
 

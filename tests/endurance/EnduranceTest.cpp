@@ -35,15 +35,10 @@ int Rounds() {
     return asked ? std::max(std::atoi(asked), kWarmUpRounds + 1) : 150;
 }
 
-/// Bytes on the heap that are in use, of all threads together.
-int64_t Memory() {
-    return static_cast<int64_t>(mallinfo2().uordblks);
-}
-
 struct Usage {
     int64_t threads = CountEntries("/proc/self/task");
     int64_t descriptors = CountEntries("/proc/self/fd");
-    int64_t memory = Memory();
+    int64_t memory = static_cast<int64_t>(mallinfo2().uordblks); ///< Bytes in use, of all threads together.
 };
 
 void DropEvents() {
@@ -79,23 +74,16 @@ struct Job {
 enum Ending { kStop, kAbortAndWait, kPauseAndStop, kDestroy, kEndings };
 
 void End(std::unique_ptr<Job>& job, int ending) {
-    switch (ending) {
-    case kAbortAndWait:
+    if (ending == kAbortAndWait) {
         MCAbort(job->handle);
         EXPECT_EQ(MCWait(job->handle, MC_INFINITE), 0);
-        break;
-    case kPauseAndStop:
-        MCPause(job->handle);
-        MCStop(job->handle);
-        break;
-    case kDestroy:
-        job.reset();
-        return;
-    default:
-        MCStop(job->handle);
-        break;
     }
-    EXPECT_EQ(job->ends, 1) << "one finished call for each conversion";
+    if (ending == kPauseAndStop)
+        MCPause(job->handle);
+    if (ending != kDestroy) {
+        MCStop(job->handle);
+        EXPECT_EQ(job->ends, 1) << "one finished call for each conversion";
+    }
     job.reset();
 }
 
