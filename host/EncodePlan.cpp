@@ -10,6 +10,7 @@
 namespace host {
 namespace {
 
+constexpr double kHighestFrameRate = 200; // of the output: from a source of more the engine makes 30
 constexpr uint32_t kSteadyRateFormat = FourCC("AVI "); // leaves out what comes faster than its one rate
 
 uint32_t CodecCode(const std::string& text, const char* option) {
@@ -63,8 +64,9 @@ EncodeParam PlanEncoding(const EncodeParam& defaults, const FileFormatInfo& form
     param.bResize = options.fit == Fit::kStretch ? 1 : 0;
     if (options.frameRate) // no reference to the record's double, which lies on a 4-byte boundary
         param.dFrameRate = *options.frameRate;
-    else if (source.pictures && format.fccFormat == kSteadyRateFormat)
-        param.dFrameRate = source.pictures->peakRate;
+    else if (source.pictures && format.fccFormat == kSteadyRateFormat &&
+             source.pictures->frameRate <= kHighestFrameRate)
+        param.dFrameRate = std::min(source.pictures->peakRate, kHighestFrameRate);
     param.nVideoBitrate = options.videoRate.value_or(param.nVideoBitrate);
     param.nVideoMaxBitrate = options.videoMaxRate.value_or(0);
     param.nVideoRateMode = options.videoMaxRate ? 1 : 0;

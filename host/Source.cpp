@@ -21,9 +21,11 @@ constexpr double kShortestStream = 0.001;  // the engine takes a shorter one for
 constexpr double kGuessedDuration = 3600;  // for sources that tell nothing at all, such as pipes
 constexpr int64_t kStretchBytes = 2 << 20; // read at the end, and at the beginning, to find the duration
 constexpr double kClockStart = 1;         // a stamp below, far into the file, shows that they do not count on
-constexpr double kHighestFrameRate = 200; // rates above are artefacts of the container's clock
+constexpr double kUsualFrameRate = 200;   // a higher one may be an artefact of the container's clock
+constexpr double kHighestPeakRate = 240;  // likewise where pictures follow each other closest
+constexpr int kCountedPictures = 250;     // to find out how many there are in a second
+constexpr double kFallbackFrameRate = 25; // pictures keep their own times whatever rate is told
 constexpr char kProtocols[] = "file,crypto,data"; // a playlist names files, but never opens the network
-constexpr AVRational kFallbackFrameRate{25, 1};
 
 int WasInterrupted(void* file) {
     return static_cast<const InputFile*>(file)->Interrupted() ? 1 : 0;
@@ -33,22 +35,27 @@ std::string CannotOpen(const std::string& path, const std::string& reason) {
     return "cannot open \"" + path + "\": " + reason;
 }
 
-bool IsPlausible(AVRational rate) {
-    return rate.num > 0 && rate.den > 0 && av_q2d(rate) <= kHighestFrameRate;
+bool IsTold(AVRational rate) {
+    return rate.num > 0 && rate.den > 0;
 }
 
-/// The average rate, or the container's nominal one where they agree: the average of a short movie is
-/// inexact.
-AVRational FrameRate(const AVStream* stream) {
+bool IsUsual(AVRational rate) {
+    return IsTold(rate) && av_q2d(rate) <= kUsualFrameRate;
+}
+
+/// Whether `rate` is about the other one: a container rounds times, and a short movie its average.
+bool IsAbout(AVRational rate, double other, double tolerance) {
+    return IsTold(rate) && std::abs(av_q2d(rate) / other - 1) < tolerance;
+}
+
+/// Pictures per second by the container's word: the average rate, or its nominal one where they agree. 0 when
+/// neither is usual.
+double ToldFrameRate(const AVStream* stream) {
     const AVRational average = stream->avg_frame_rate;
     const AVRational nominal = stream->r_frame_rate;
-    if (IsPlausible(average) && IsPlausible(nominal)) {
-        const bool agree = std::abs(av_q2d(nominal) / av_q2d(average) - 1) < 0.01;
-        return agree ? nominal : average;
-    }
-    if (IsPlausible(average))
-        return average;
-    return IsPlausible(nominal) ? nominal : kFallbackFrameRate;
+    if (IsUsual(average))
+        return av_q2d(IsUsual(nominal) && IsAbout(nominal, av_q2d(average), 0.01) ? nominal : average);
+    return IsUsual(nominal) ? av_q2d(nominal) : 0;
 }
 
 /// Matroska and NUT announce where the movie ends on its clock, all others how long it is.
@@ -104,6 +111,8 @@ double SourceInfo::Announced(double seconds) const {
 Source::Source(const std::string& path, SourceChoice choice) : choice_(choice) {
     info_.path = path;
     Open();
+    if (info_.pictures)
+        FindFrameRate();
     FindDuration();
 }
 
@@ -197,12 +206,9 @@ void Source::DescribePictures(int index) {
     info.width = turned ? parameters->height : parameters->width;
     info.height = turned ? parameters->width : parameters->height;
     info.pixelAspect = PixelAspect(input_.get(), stream, turned);
-    info.frameRate = av_q2d(FrameRate(stream));
-    info.peakRate = info.frameRate;
+    info.frameRate = ToldFrameRate(stream);
     info.duration = EndOf(stream);
     info.interlaced = parameters->field_order > AV_FIELD_PROGRESSIVE;
-    if (IsPlausible(stream->r_frame_rate) && !info.interlaced) // where it may count fields
-        info.peakRate = std::max(info.frameRate, av_q2d(stream->r_frame_rate));
     info.colorPrimaries = parameters->color_primaries;
     info.colorTransfer = parameters->color_trc;
     info.colorMatrix = parameters->color_space;
@@ -236,6 +242,47 @@ double Source::EndOf(const AVStream* stream) const {
     return stream->duration > 0
                ? BeginOf(stream) + static_cast<double>(stream->duration) * av_q2d(stream->time_base)
                : 0;
+}
+
+/// Pictures per second by the container's index, or by the stamps of the first ones; 0 when neither can be
+/// read.
+double Source::CountFrameRate() {
+    AVStream* stream = input_->streams[info_.pictures->index];
+    if (av_match_name("mov", input_->iformat->name) != 0 && stream->nb_frames > 1 && stream->duration > 0) {
+        const double indexed = static_cast<double>(stream->nb_frames) /
+                               (static_cast<double>(stream->duration) * av_q2d(stream->time_base));
+        if (IsAbout(stream->avg_frame_rate, indexed, 0.05))
+            return indexed;
+    }
+    if (!IsSeekable())
+        return 0;
+    AVStream* sound = info_.sound ? input_->streams[info_.sound->index] : nullptr;
+    if (sound != nullptr)
+        sound->discard = AVDISCARD_ALL;
+    const Stretch begin = ReadStretch(8 * kStretchBytes, kCountedPictures);
+    if (sound != nullptr)
+        sound->discard = AVDISCARD_DEFAULT;
+    ReturnToBegin();
+    return begin.packets > 1 && begin.last > begin.first ? (begin.packets - 1) / (begin.last - begin.first)
+                                                         : 0;
+}
+
+/// Counts the first pictures where the container tells no usual rate, and settles the highest one.
+void Source::FindFrameRate() {
+    PictureStreamInfo& info = *info_.pictures;
+    const AVStream* stream = PictureStream();
+    if (info.frameRate <= 0) {
+        const double counted = CountFrameRate();
+        info.frameRate = counted > 0 ? counted : kFallbackFrameRate;
+        for (const AVRational told : {stream->avg_frame_rate, stream->r_frame_rate})
+            if (counted > 0 && IsAbout(told, counted, 0.05))
+                info.frameRate = av_q2d(told);
+    }
+    info.peakRate = info.frameRate;
+    if (IsTold(stream->r_frame_rate) && !info.interlaced) { // where it may count fields
+        if (const double peak = av_q2d(stream->r_frame_rate); peak <= kHighestPeakRate)
+            info.peakRate = std::max(info.peakRate, peak);
+    }
 }
 
 void Source::FindDuration() {
@@ -295,9 +342,9 @@ void Source::MeasureDuration() {
         info_.duration = kGuessedDuration;
 }
 
-/// Reads to the end or for `mostBytes`. That may describe the streams anew, as they are there; for the
-/// decoders they are as at the beginning.
-Source::Stretch Source::ReadStretch(int64_t mostBytes) {
+/// Reads to the end, or until it has so many bytes or packets of the stream that is counted. That may
+/// describe the streams anew, as they are there; for the decoders they are as at the beginning.
+Source::Stretch Source::ReadStretch(int64_t mostBytes, int mostPackets) {
     std::vector<av::CodecParameters> beginnings;
     for (unsigned i = 0; i < input_->nb_streams; ++i) {
         beginnings.emplace_back(avcodec_parameters_alloc());
@@ -306,14 +353,18 @@ Source::Stretch Source::ReadStretch(int64_t mostBytes) {
     const int counted = info_.pictures ? info_.pictures->index : info_.sound->index;
     Stretch stretch;
     const av::Packet packet = av::NewPacket();
-    while (stretch.bytes < mostBytes && av_read_frame(input_.get(), packet.get()) >= 0) {
+    while (stretch.bytes < mostBytes && stretch.packets < mostPackets &&
+           av_read_frame(input_.get(), packet.get()) >= 0) {
         const AVStream* stream = input_->streams[packet->stream_index];
         stretch.bytes += packet->size;
-        if (packet->stream_index == counted)
+        if (packet->stream_index == counted) {
+            ++stretch.packets;
             stretch.length += static_cast<double>(packet->duration) * av_q2d(stream->time_base);
+        }
         const int64_t stamp = packet->pts != AV_NOPTS_VALUE ? packet->pts : packet->dts;
         if (stamp != AV_NOPTS_VALUE) {
             stretch.first = std::min(stretch.first, ToSeconds(MediaTime(stamp, stream)));
+            stretch.last = std::max(stretch.last, ToSeconds(MediaTime(stamp, stream)));
             stretch.end = std::max(stretch.end, ToSeconds(MediaTime(stamp + packet->duration, stream)));
         }
         av_packet_unref(packet.get());

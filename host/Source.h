@@ -103,8 +103,10 @@ private:
     struct Stretch {
         int64_t bytes = 0;
         double first = std::numeric_limits<double>::infinity(); // stamp
-        double end = 0;                                         // of what lasts longest
-        double length = 0; // of the packets of one stream, pictures if there are any
+        double last = 0;
+        double end = 0;    // of what lasts longest
+        int packets = 0;   // of one stream, pictures if there are any
+        double length = 0; // of these packets
     };
 
     void Open();
@@ -113,9 +115,11 @@ private:
     void DescribeSound(int index);
     double BeginOf(const AVStream* stream) const;
     double EndOf(const AVStream* stream) const;
+    void FindFrameRate();
+    double CountFrameRate();
     void FindDuration();
     void MeasureDuration();
-    Stretch ReadStretch(int64_t mostBytes);
+    Stretch ReadStretch(int64_t mostBytes, int mostPackets = std::numeric_limits<int>::max());
     void ReturnToBegin();
 
     const SourceChoice choice_;

@@ -134,6 +134,9 @@ const Args kLateSound = Join(CountedPictures(3), Args{"-itsoffset", "1"}, Beeps(
 const Args kVariable = Join(CountedPictures(4), Args{"-vf", "select='lt(mod(n,6),3)'", "-fps_mode", "vfr"});
 const Args kStill = Join(CountedPictures(14), Beeps(14), Args{"-vf", "select='lt(n,1)+gt(n,250)'"},
                          Args{"-fps_mode", "vfr"}, kLossless);
+const Args kFast = Join(CountedPictures(1, "240"), Args{"-c:v", "libx264"});
+const Args kMilliseconds = Join(CountedPictures(1), Args{"-enc_time_base", "1/1000", "-fps_mode", "vfr"},
+                                Args{"-vf", "settb=1/1000", "-c:v", "mjpeg"});
 const Args kSurround = Join(CountedPictures(1), Beeps(1), Args{"-c:v", "mpeg4", "-c:a", "ac3", "-ac", "6"});
 
 // A part has the picture shown at its begin, and those that begin before its end.
@@ -148,6 +151,8 @@ const Odd kOddities[] = {
     {"late-sound.mkv", kLateSound, "o.avi", 75, 3},
     {"still.mkv", kStill, "o.flv", 100, 14},
     {"variable.mp4", kVariable, "o.avi", 100, 0},
+    {"fast.mkv", kFast, "o.mp4", 31, 0}, // a rate that the engine brings down to 30
+    {"milliseconds.avi", kMilliseconds, "o.avi", 25, 0},
     {"plain.mkv", Lossless(2, 2), "o.mkv", 50, 0, {"--no-audio"}},
     {"plain.mkv", Lossless(2, 2), "o.mp3", 0, 2, {"--no-video"}},
     {"plain.mkv", Lossless(2, 2), "o.webm", 26, 1, {"--begin", "0.5", "--length", "1"}},
