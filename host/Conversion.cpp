@@ -229,6 +229,8 @@ void Conversion::ReportProgress() {
 ExitCode Conversion::Conclude() {
     TakeNews();
     if (preview_) {
+        if (const VideoImage* last = movie_.LastPicture()) // the engine shows but some
+            preview_->Offer(*last);
         if (const std::string failure = preview_->Finish(); !failure.empty())
             reporter_.Warning(failure);
     }

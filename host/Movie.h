@@ -24,6 +24,9 @@ public:
     VideoDecoder* Pictures() { return pictures_.get(); }
     AudioDecoder* Sound() { return sound_.get(); }
 
+    /// The picture handed out last, null without one. Once the conversion has ended.
+    const VideoImage* LastPicture() const { return pictures_ ? pictures_->Last() : nullptr; }
+
     /// Leaves out the pictures from that time on, where the engine would write one more. Only before the
     /// conversion.
     void EndPicturesAt(double seconds);

@@ -44,6 +44,9 @@ public:
     int64_t Damaged() const { return damaged_; }
     int64_t Repaired() const { return repaired_; }
     int64_t Delivered() const { return delivered_; }
+
+    /// The picture handed out last, null without one. Once the conversion has ended.
+    const VideoImage* Last() const { return current_.frame ? &image_ : nullptr; }
     int Threads() const { return threads_; }
 
 private:

@@ -271,11 +271,17 @@ TEST(Program, PrintsValidJsonAndNothingElse) {
 
 TEST(Program, KeepsAPreview) {
     const Folder folder;
-    ASSERT_EQ(Call({Counted(), folder / "out.mp4", "--preview", folder / "now.png"}).code, 0);
-    const Seen seen = LookAt(folder / "now.png");
-    ASSERT_EQ(seen.pictures.size(), 1u);
-    EXPECT_EQ(seen.pictures[0].width, 160);
-    EXPECT_NEAR(seen.pictures[0].luma, LumaOf(99), 4);
+    for (const Args& options : {Args{}, Args{"--no-audio"}, Args{"--length", "0.5"}}) {
+        ASSERT_EQ(
+            Call(Join(Args{Counted(), folder / "out.mp4", "-y", "--preview", folder / "now.png"}, options))
+                .code,
+            0);
+        const Seen seen = LookAt(folder / "now.png");
+        ASSERT_EQ(seen.pictures.size(), 1u);
+        EXPECT_EQ(seen.pictures[0].width, 160);
+        EXPECT_NEAR(seen.pictures[0].luma, LumaOf(options.size() < 2 ? 99 : 12), 2);
+        fs::remove(folder / "now.png");
+    }
 
     const Result without =
         Call({Counted(), folder / "out.mkv", "--preview", folder / "nowhere/now.png", "--progress", "none"});
