@@ -139,7 +139,8 @@ void AddReports(CLI::App& app, Options& options) {
     AddChoice<ProgressStyle>(
         app, "--progress", options.progress,
         {{"bar", ProgressStyle::kBar}, {"json", ProgressStyle::kJson}, {"none", ProgressStyle::kNone}},
-        "A live line, or plain lines without a terminal (bar,\nthe default); one JSON object a line; or none")
+        "A live line, or plain lines without a terminal (bar,\nthe default); one JSON object a line; or the "
+        "end only")
         ->group(group);
     app.add_flag("-q,--quiet", options.quiet, "Print nothing but errors")->group(group);
     app.add_option("--log", options.log, "Append the engine's log to this file")
