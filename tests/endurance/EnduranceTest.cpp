@@ -1,6 +1,7 @@
-// Many conversions in one process, two at a time, ended at random moments in every way there is: nothing may
-// pile up. MOVIECONV_ENDURANCE sets the number of rounds. Built twice: for the engine alone, over the
-// recording writer, and for the whole with the real one.
+// Many conversions in one process, two at a time, one of them paused, resumed and queried from another
+// thread, and ended at random moments in every way there is: nothing may hang or pile up, and the thread
+// sanitizer has to stay silent. MOVIECONV_ENDURANCE sets the number of rounds. Built twice: for the engine
+// alone, over the recording writer, and for the whole with the real one.
 #include "api/MovieConv.h"
 #include "tests/engine/IdleParts.h"
 #include "tests/support/Folder.h"
@@ -55,20 +56,49 @@ struct Job {
         MCSetOutputFile(handle, file.c_str());
         MCSetSplitParam(handle, kind == 0, 1000);
     }
-    ~Job() { MCDestroy(handle); }
-    Job(const Job&) = delete;
-    Job& operator=(const Job&) = delete;
+    ~Job() {
+        LeaveAlone();
+        MCDestroy(handle);
+    }
 
-    static unsigned Callback(void* context, unsigned kind, unsigned, uintptr_t) {
+    void Meddle() {
+        for (unsigned round = 0; !left; ++round) {
+            MCPause(handle);
+            MCPause(handle);
+            MCResume(handle);
+            MCResume(handle);
+            MCEnablePreview(handle, round % 2);
+            EncodeParam param;
+            MCGetEncodeParam(handle, &param);
+            MCGetEstimateDiskSpace(handle);
+            wchar_t name[MC_MAX_TARGET_NAME];
+            for (int i = MCGetTargetCount(handle) - 1; i >= 0 && i % 50 != 0; --i)
+                EXPECT_EQ(MCGetTargetFileName(handle, name, i), 1);
+            MCWait(handle, 0);
+            std::this_thread::sleep_for(std::chrono::microseconds(200));
+        }
+    }
+
+    /// No other thread uses the converter any more.
+    void LeaveAlone() {
+        left = true;
+        if (meddler.joinable())
+            meddler.join();
+    }
+
+    static unsigned Callback(void* context, unsigned kind, unsigned, uintptr_t info) {
         if (kind == 1)
             ++static_cast<Job*>(context)->ends;
-        return 1;
+        const auto* record = reinterpret_cast<const ProgressInfo*>(info);
+        return !record || record->nProgress >= 0;
     }
 
     IdleVideo video;
     IdleAudio audio;
     MCHandle handle;
     std::atomic<int> ends{0};
+    std::atomic<bool> left{false};
+    std::thread meddler;
 };
 
 enum Ending { kStop, kAbortAndWait, kPauseAndStop, kDestroy, kEndings };
@@ -95,6 +125,7 @@ void Round(std::mt19937& random, const std::wstring& folder) {
         ASSERT_NE(job->handle, nullptr);
         ASSERT_EQ(MCStart(job->handle, 0.0, 0.0, nullptr, Job::Callback, job.get()), 0);
     }
+    jobs[0]->meddler = std::thread(&Job::Meddle, jobs[0].get());
     for (auto& job : jobs) {
         std::this_thread::sleep_for(std::chrono::microseconds(random() % 3000));
         End(job, static_cast<int>(random() % kEndings));

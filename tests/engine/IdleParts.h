@@ -42,11 +42,7 @@ public:
     explicit IdleAudio(int64_t count) : left(count) {
         info.format = {8000, 1, 8, 8000, static_cast<double>(count) / 50};
         static unsigned char samples[160]{};
-        block.nSampleRate = 8000;
-        block.nChannels = 1;
-        block.nBitsPerSample = 8;
-        block.pData = samples;
-        block.nLength = sizeof samples;
+        block = {0, 8000, 1, 8, samples, sizeof samples, sizeof samples, {}, 0, 0, 200000};
     }
     AudioSourceInfo* GetAudioInfo() override { return &info; }
     double Seek(double) override { return 0.0; }

@@ -2,14 +2,9 @@
 #include "media/MediaWriter.h"
 #include "platform/Platform.h"
 
-namespace {
-
-int g_file;
-
-} // namespace
-
 void* MWCreateMediaFile(const wchar_t*, const EncodeParam*, const VideoFormat*, const AudioFormat*) {
-    return &g_file;
+    static int file;
+    return &file;
 }
 int MWWriteVideoFrame(void*, const VideoImage*) {
     return 1;

@@ -43,6 +43,14 @@ std::string Lines(bool ofLog, bool others) {
     return lines;
 }
 
+/// Stamps of `count` records from 0 on, `step` apart.
+std::vector<int64_t> Stamps(int64_t step, size_t count) {
+    std::vector<int64_t> stamps(count);
+    for (size_t i = 0; i < count; ++i)
+        stamps[i] = step * static_cast<int64_t>(i);
+    return stamps;
+}
+
 } // namespace
 
 void AdvanceClock(uint32_t ms) {
@@ -106,8 +114,6 @@ int ScriptedVideo::DecodeNext(int mode) {
     if (overwrites && !atEnd)
         Load();
     AdvanceClock(stepMs);
-    if (onNext)
-        onNext(position);
     const int result = atEnd && announcesEnd ? 0 : mode;
     Note(Line("next -> %d", result));
     return result;
@@ -124,17 +130,18 @@ double ScriptedAudio::Seek(double seconds) {
 
 AudioFrame ScriptedAudio::Block(size_t index) const {
     static unsigned char samples[1 << 16]; // more than any test's blocks
-    AudioFrame frame{};
-    frame.nType = 42;
-    frame.nSampleRate = info.format.nSampleRate;
-    frame.pData = samples + index % 256;
-    frame.nLength = blockLength;
-    frame.nBufferSize = blockLength + 1;
-    frame.reserved[27] = 200;
-    frame.llTime2 = stamps[index] + 3;
-    frame.llTime = stamps[index];
-    frame.nDuration = static_cast<int32_t>(index);
-    return frame;
+    const int64_t time = stamps[index];
+    return {42,
+            info.format.nSampleRate,
+            0,
+            0,
+            samples + index % 256,
+            blockLength,
+            blockLength + 1,
+            {200},
+            time + 3,
+            time,
+            static_cast<int32_t>(index)};
 }
 
 AudioFrame* ScriptedAudio::GetNextFrame() {
@@ -149,21 +156,14 @@ AudioFrame* ScriptedAudio::GetNextFrame() {
     return &block;
 }
 
-std::vector<int64_t> Stamps(int64_t first, int64_t step, size_t count) {
-    std::vector<int64_t> stamps(count);
-    for (size_t i = 0; i < count; ++i)
-        stamps[i] = first + step * static_cast<int64_t>(i);
-    return stamps;
-}
-
 ScriptedHost::ScriptedHost() {
     recorder::Reset();
     g_ticks = 0xFFFFFF00 / 10; // so that every longer test crosses the wrap
 }
 
 void ScriptedHost::SetMovie(size_t pictures, size_t blocks) {
-    video.stamps = Stamps(0, kSecond / 10, pictures);
-    audio.stamps = Stamps(0, kSecond / 20, blocks);
+    video.stamps = Stamps(kSecond / 10, pictures);
+    audio.stamps = Stamps(kSecond / 20, blocks);
     video.Format().dDuration = static_cast<double>(pictures) / 10;
     audio.Format().dDuration = static_cast<double>(blocks) / 20;
 }
@@ -210,6 +210,8 @@ unsigned ScriptedHost::Callback(void* context, unsigned kind, unsigned value, ui
     Note(name + std::to_string(static_cast<int>(value)) + Describe(info) + (usual ? "" : " unusual"));
     if (host.onCallback)
         host.onCallback(kind, info);
+    if (host.records.size() == host.abortAt)
+        MCAbort(host.handle);
     return kind == 0 && host.records.size() == host.cancelAt ? 0 : 1;
 }
 

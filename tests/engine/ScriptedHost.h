@@ -46,12 +46,11 @@ public:
     VideoImage Image(size_t index) const;
 
     std::vector<int64_t> stamps;
-    int descriptions = INT_MAX;         // so many calls find one, later ones none
-    bool staysAtLast = false;           // goes on handing out the last picture after the end
-    bool announcesEnd = true;           // DecodeNext tells the end; otherwise the picture is missing
-    bool overwrites = false;            // one record for all pictures; otherwise each has its own
-    uint32_t stepMs = 0;                // what the clock advances at each DecodeNext
-    std::function<void(size_t)> onNext; // told the number of pictures done
+    int descriptions = INT_MAX; // so many calls find one, later ones none
+    bool staysAtLast = false;   // goes on handing out the last picture after the end
+    bool announcesEnd = true;   // DecodeNext tells the end; otherwise the picture is missing
+    bool overwrites = false;    // one record for all pictures; otherwise each has its own
+    uint32_t stepMs = 0;        // what the clock advances at each DecodeNext
 
 private:
     /// Fills the record of the current picture.
@@ -97,9 +96,6 @@ private:
     size_t position = 0;
 };
 
-/// Stamps from `first` on, `count` of them, `step` apart.
-std::vector<int64_t> Stamps(int64_t first, int64_t step, size_t count);
-
 /// A converter over scripted decoders. Notes the callbacks:
 ///     progress VALUE at POSITION [done LENGTH] [speed SPEED] [preview STAMP]
 ///     finished OUTCOME at POSITION [done LENGTH] [speed SPEED], or finished OUTCOME without record
@@ -141,6 +137,7 @@ public:
     bool hasAudio = true;
     bool hasCallback = true;
     unsigned cancelAt = 0; // number of the progress call, from 1, that returns 0
+    unsigned abortAt = 0;  // number of the one that asks for a stop
     std::function<void(unsigned kind, const ProgressInfo*)> onCallback;
     OpaqueWindowPtr* window = nullptr;
     MCHandle handle = nullptr;

@@ -36,26 +36,15 @@ Setting Into(Value& value) {
     return [&value](std::istream& words) { words >> value; };
 }
 
-template <class List>
-List Rest(std::istream& words) {
-    return {std::istream_iterator<typename List::value_type>(words), {}};
-}
-
 Setting Into(std::vector<int64_t>& values) {
-    return [&values](std::istream& words) { values = Rest<std::vector<int64_t>>(words); };
+    using Words = std::istream_iterator<int64_t>;
+    return [&values](std::istream& words) { values = std::vector<int64_t>(Words(words), Words()); };
 }
 
 /// Sets a field of the parameters.
 Setting Into(ScriptedHost& host, int32_t EncodeParam::*field) {
     return [&host, field](std::istream& words) {
         host.Change([&](EncodeParam& param) { words >> param.*field; });
-    };
-}
-
-void AbortAfterPicture(ScriptedHost& host, size_t last) {
-    host.video.onNext = [&host, last](size_t done) {
-        if (done == last)
-            MCAbort(host.handle);
     };
 }
 
@@ -93,9 +82,9 @@ std::map<std::string, Setting> Settings(Script& script) {
         {"length", Into(script.length)},
         {"window", [&](std::istream&) { host.window = reinterpret_cast<OpaqueWindowPtr*>(0x1234); }},
         {"cancel-at-call", Into(host.cancelAt)},
-        {"abort-after-pictures", [&](std::istream& words) { AbortAfterPicture(host, Next<size_t>(words)); }},
-        {"failing-creates",
-         [](std::istream& words) { recorder::Reset({.failingCreates = Rest<std::set<int>>(words)}); }},
+        {"abort-at-call", Into(host.abortAt)},
+        {"failing-create",
+         [](std::istream& words) { recorder::Reset({.failingCreates = {Next<int>(words)}}); }},
         {"split-ms", [&](std::istream& words) { host.Split(Next<unsigned long>(words)); }},
         {"video-bitrate", Into(host, &EncodeParam::nVideoBitrate)},
         {"output-sample-rate", Into(host, &EncodeParam::nSampleRate)},

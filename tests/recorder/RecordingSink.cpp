@@ -7,10 +7,8 @@ extern "C" __attribute__((visibility("default"))) int Log(const wchar_t* text) {
     for (; *text; ++text) {
         const char character = *text < 0x80 ? static_cast<char>(*text) : '?';
         const size_t control = kControls.find(character);
-        if (control == std::string_view::npos)
-            line += character;
-        else
-            line += {'\\', "rnt"[control]};
+        line +=
+            control == std::string_view::npos ? std::string{character} : std::string{'\\', "rnt"[control]};
     }
     recorder::Note(line);
     return 1;

@@ -106,11 +106,7 @@ int MWWriteAudioData(void* file, const AudioFrame* frame) {
 int MWCloseMediaFile(void* file, ProgressCallback callback, void* context) {
     if (callback)
         Call(&recorder::Behaviour::onClose);
-    std::string line = Line("close #%d", Number(file));
-    if (callback)
-        line += context ? " with callback and context" : " with callback";
-    else if (context)
-        line += " with context";
-    recorder::Note(line);
+    const char* const with[] = {"", " with context", " with callback", " with callback and context"};
+    recorder::Note(Line("close #%d%s", Number(file), with[(callback ? 2 : 0) + (context ? 1 : 0)]));
     return file != nullptr;
 }
