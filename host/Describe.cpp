@@ -2,6 +2,7 @@
 
 #include "host/Units.h"
 
+#include <cmath>
 #include <fmt/format.h>
 
 namespace host {
@@ -25,7 +26,7 @@ std::string DescribeLength(const SourceInfo& source) {
     case Certainty::kGuessed:
         return "unknown";
     case Certainty::kEstimated:
-        return "about " + FormatTime(source.duration);
+        return "about " + FormatTime(std::round(source.duration));
     case Certainty::kKnown:
         break;
     }
