@@ -20,11 +20,11 @@ namespace {
 constexpr double kShortestStream = 0.001;  // the engine takes a shorter one for absent
 constexpr double kGuessedDuration = 3600;  // for sources that tell nothing at all, such as pipes
 constexpr int64_t kStretchBytes = 2 << 20; // read at the end, and at the beginning, to find the duration
-constexpr double kClockStart = 1;         // a stamp below, far into the file, shows that they do not count on
-constexpr double kUsualFrameRate = 200;   // a higher one may be an artefact of the container's clock
-constexpr double kHighestPeakRate = 240;  // likewise where pictures follow each other closest
-constexpr int kCountedPictures = 250;     // to find out how many there are in a second
-constexpr double kFallbackFrameRate = 25; // pictures keep their own times whatever rate is told
+constexpr double kClockStart = 8;       // a stamp below, far into the file, may count on from what was probed
+constexpr double kUsualFrameRate = 200; // a higher one may be an artefact of the container's clock
+constexpr double kHighestPeakRate = 240;          // likewise where pictures follow each other closest
+constexpr int kCountedPictures = 250;             // to find out how many there are in a second
+constexpr double kFallbackFrameRate = 25;         // pictures keep their own times whatever rate is told
 constexpr char kProtocols[] = "file,crypto,data"; // a playlist names files, but never opens the network
 
 int WasInterrupted(void* file) {
@@ -290,11 +290,14 @@ void Source::FindDuration() {
     info_.duration = input_->duration > 0 ? static_cast<double>(input_->duration) / AV_TIME_BASE : 0;
     if (info_.duration > 0 && AnnouncesItsEnd(*input_->iformat))
         info_.duration -= ToSeconds(start_);
-    if (info_.duration <= 0 || guessedByRate)
+    // ASF has its length from whoever wrote it, who may have taken the last stamp for it.
+    const bool doubtful = av_match_name("asf", input_->iformat->name) != 0 && start_ > kMediaSecond;
+    const bool measured = info_.duration <= 0 || guessedByRate || doubtful;
+    if (measured)
         MeasureDuration();
     const double whole = info_.duration;
     const auto complete = [&](double& duration) {
-        if (duration <= 0 || info_.certainty != Certainty::kKnown || guessedByRate)
+        if (duration <= 0 || measured)
             duration = whole;
         info_.duration = std::max(info_.duration, duration);
     };

@@ -98,6 +98,9 @@ std::string CountedMkv() {
 std::string CountedFromTen() {
     return Make("from-ten.mkv", {"-i", CountedMkv(), "-c", "copy", "-output_ts_offset", "10"});
 }
+std::string CountedAsfFromTen() {
+    return Make("from-ten.asf", {"-i", CountedMkv(), "-c", "copy", "-output_ts_offset", "10"});
+}
 std::string CountedOneKeyPicture() {
     return Make("onekey.mp4", Join(CountedPictures(4), Beeps(4), H264Aac(), Args{"-g", "1000"}));
 }
@@ -111,6 +114,7 @@ const SeekCase kSeekCases[] = {
     {"TransportStreamBeforeItsSecondKeyPicture", CountedTs, 0.83, 20},
     {"Matroska", CountedMkv, 2.41, 60},
     {"ClockThatStartsAtTenSeconds", CountedFromTen, 2.41, 60},
+    {"AsfThatAnnouncesItsLastStamp", CountedAsfFromTen, 2.41, 60},
     {"FarFromAKeyPicture", CountedOneKeyPicture, 3.0, 75},
 };
 INSTANTIATE_TEST_SUITE_P(Movies, DecodersSeek, testing::ValuesIn(kSeekCases),
