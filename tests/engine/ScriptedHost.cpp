@@ -76,10 +76,6 @@ OSStatus PostEventToQueue(EventQueueRef queue, EventRef event, EventPriority pri
     return noErr;
 }
 
-ScriptedVideo::ScriptedVideo() {
-    info.format = {320, 240, 10.0, 1.0};
-}
-
 double ScriptedVideo::Seek(double seconds, int mode) {
     Note(Line("seek video %g %d", seconds, mode));
     return seconds;
@@ -119,10 +115,6 @@ int ScriptedVideo::DecodeNext(int mode) {
     return result;
 }
 
-ScriptedAudio::ScriptedAudio() {
-    info.format = {1000, 1, 8, 1000, 1.0};
-}
-
 double ScriptedAudio::Seek(double seconds) {
     Note(Line("seek audio %g", seconds));
     return seconds;
@@ -131,17 +123,10 @@ double ScriptedAudio::Seek(double seconds) {
 AudioFrame ScriptedAudio::Block(size_t index) const {
     static unsigned char samples[1 << 16]; // more than any test's blocks
     const int64_t time = stamps[index];
-    return {42,
-            info.format.nSampleRate,
-            0,
-            0,
-            samples + index % 256,
-            blockLength,
-            blockLength + 1,
-            {200},
-            time + 3,
-            time,
-            static_cast<int32_t>(index)};
+    const int32_t rate = info.format.nSampleRate;
+    unsigned char* const data = samples + index % 256;
+    const auto number = static_cast<int32_t>(index);
+    return {42, rate, 0, 0, data, blockLength, blockLength + 1, {200}, time + 3, time, number};
 }
 
 AudioFrame* ScriptedAudio::GetNextFrame() {

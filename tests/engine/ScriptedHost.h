@@ -26,8 +26,6 @@ void AdvanceClock(uint32_t ms);
 /// and "reserved" for an operation that must never be called, as ScriptedAudio does.
 class ScriptedVideo : public VideoDecoder {
 public:
-    ScriptedVideo();
-
     VideoSourceInfo* GetVideoInfo() override { return descriptions-- > 0 ? &info : nullptr; }
     double Seek(double seconds, int mode) override;
     VideoImage* GetCurrentImage() override;
@@ -56,19 +54,16 @@ private:
     /// Fills the record of the current picture.
     VideoImage* Load();
 
-    VideoSourceInfo info{};
+    VideoSourceInfo info{{}, {320, 240, 10.0, 1.0}};
     std::vector<VideoImage> images;
     size_t position = 0;
 };
 
-/// Plays blocks of `blockLength` bytes with the given stamps. Notes
+/// Plays blocks of `blockLength` bytes, 1000 a second, with the given stamps. Notes
 ///     seek audio SECONDS
 ///     block STAMP, or block none
 class ScriptedAudio : public AudioDecoder {
 public:
-    /// Sound of 1000 bytes a second: 1000 Hz, one channel, 8 bits.
-    ScriptedAudio();
-
     AudioSourceInfo* GetAudioInfo() override { return descriptions-- > 0 ? &info : nullptr; }
     double Seek(double seconds) override;
     AudioFrame* GetNextFrame() override;
@@ -91,7 +86,7 @@ public:
     uint32_t stepMs = 0;    // what the clock advances at each block
 
 private:
-    AudioSourceInfo info{};
+    AudioSourceInfo info{{}, {1000, 1, 8, 1000, 1.0}};
     AudioFrame block{};
     size_t position = 0;
 };
