@@ -3,6 +3,7 @@
 #include "host/OutputCheck.h"
 #include "host/Units.h"
 
+#include <algorithm>
 #include <cmath>
 #include <cstring>
 #include <fmt/format.h>
@@ -52,14 +53,16 @@ std::string TextOf(const WriterStatus& failure) {
 
 /// Compares a complete file with what was sent into it. Empty when everything is there.
 std::string MissingFrom(const WriterStatus& file) {
-    const auto compare = [&](const char* what, double written, double received) {
-        if (std::abs(written - received) <= kLengthTolerance)
+    const auto compare = [&](const char* what, double written, double received, double frame) {
+        if (std::abs(written - received) <= std::max(kLengthTolerance, frame))
             return std::string();
         return fmt::format("\"{}\" holds {:.3f} s of {}, but {:.3f} s were sent into it", file.szPath,
                            written, what, received);
     };
-    const std::string pictures = compare("pictures", file.dVideoWritten, file.dVideoReceived);
-    return pictures.empty() ? compare("sound", file.dAudioWritten, file.dAudioReceived) : pictures;
+    const std::string pictures =
+        compare("pictures", file.dVideoWritten, file.dVideoReceived,
+                file.dVideoWritten / static_cast<double>(std::max<int64_t>(1, file.llPicturesWritten)));
+    return pictures.empty() ? compare("sound", file.dAudioWritten, file.dAudioReceived, 0.0) : pictures;
 }
 
 } // namespace

@@ -146,10 +146,12 @@ bool MediaFile::WriteVideo(const VideoImage& image) {
     if (!pictures_ || !Usable(image) || record_->Failed())
         return false;
     const int64_t time = stamps_.AddPicture(image.llTime);
+    firstPicture_ = firstPicture_.value_or(time);
     record_->Update([&](WriterStatus& status) {
         ++status.llPicturesReceived;
         status.llStampsRepaired = stamps_.Repairs();
-        status.dVideoReceived = static_cast<double>(time + plan_.video->pictureLength) / kUnitsPerSecond;
+        status.dVideoReceived =
+            static_cast<double>(time - *firstPicture_ + plan_.video->pictureLength) / kUnitsPerSecond;
     });
     try {
         StartSoundIfKnown();

@@ -85,6 +85,7 @@ private:
     std::vector<SoundBlock>
         waiting_; ///< Sound whose place is not known yet, or too short a stretch to hand on.
     bool soundStarted_ = false;
+    std::optional<int64_t> firstPicture_; ///< Its time in the file.
     double toldShare_ = 0;
     std::unique_ptr<PictureStage> pictures_;
     std::unique_ptr<SoundStage> sound_;

@@ -67,7 +67,10 @@ PicturePacer::Showing PicturePacer::Add(int64_t time) {
 PicturePacer::Showing PicturePacer::Finish(int64_t end) {
     if (keepStamps_)
         return ShowOnce();
-    return ShowUntil(std::max(GridIndex(end), pending_.value_or(0) + 1));
+    // A file too short for the grid still shows a picture; otherwise one whose place is the end would only
+    // make the file longer.
+    const int64_t atLeast = lastTick_ ? 0 : pending_.value_or(0) + 1;
+    return ShowUntil(std::max(GridIndex(end), atLeast));
 }
 
 PicturePacer::Showing PicturePacer::ShowOnce() {

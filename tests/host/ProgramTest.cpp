@@ -99,6 +99,9 @@ TEST(Program, SplitsIntoClipsInStep) {
     }
     EXPECT_EQ(pictures, 200u);
     EXPECT_EQ(flashes, 8u);
+    const Args slowly = Join(CountedPictures(4), Beeps(4), Args{"-r", "2"}, kLossless); // begin clips late
+    const Result slow = Call({Make("slow.mkv", slowly), folder / "slow.mp4", "--split", "1"});
+    EXPECT_EQ(slow.code, 0) << slow.err;
 }
 
 struct Odd {
@@ -151,10 +154,11 @@ const Odd kOddities[] = {
     {"late-sound.mkv", kLateSound, "o.avi", 75, 3},
     {"still.mkv", kStill, "o.flv", 100, 14},
     {"variable.mp4", kVariable, "o.avi", 100, 0},
-    {"fast.mkv", kFast, "o.mp4", 31, 0}, // a rate that the engine brings down to 30
+    {"fast.mkv", kFast, "o.mp4", 30, 0}, // a rate that the engine brings down to 30
     {"milliseconds.avi", kMilliseconds, "o.avi", 25, 0},
     {"plain.mkv", Lossless(2, 2), "o.mkv", 50, 0, {"--no-audio"}},
     {"plain.mkv", Lossless(2, 2), "o.mp3", 0, 2, {"--no-video"}},
+    {"plain.mkv", Lossless(2, 2), "o.mkv", 2, 1.6, {"--length", "1.6", "--frame-rate", "1"}},
     {"plain.mkv", Lossless(2, 2), "o.webm", 26, 1, {"--begin", "0.5", "--length", "1"}},
     {"plain.mkv",
      Lossless(2, 2),
