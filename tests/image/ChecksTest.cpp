@@ -113,11 +113,13 @@ TEST(ChecksDeathTest, PackedToPlanesStopsBeforeTheFirstSampleOutside) {
     munmap(planes, 6 * kWidth * 3);
 }
 
-TEST(Checks, TopDownAlphaMakesNone) {
+TEST(Checks, TopDownAlphaAndTheSimpleRoutinesMakeNone) {
     unsigned char pixel[]{1, 2, 3, 44};
     unsigned char y, u, v, a;
     Rgb32_2_yuv420A(&y, &u, &v, &a, 1, 1, 1, &header24, pixel, 0);
     EXPECT_EQ(a, 44);
+    Rgb24_2_yuv420Simple(nullptr, nullptr, nullptr, 1, 1, 1, &header32, nullptr);
+    Yuv420_2_rgb24Simple(&header32, nullptr, nullptr, nullptr, nullptr, 1, 1, 1);
 }
 
 } // namespace

@@ -20,14 +20,14 @@ constexpr int Floor(int dividend, int divisor) {
     return dividend % divisor < 0 ? dividend / divisor - 1 : dividend / divisor;
 }
 
-/// Y as stored, Cb and Cr around 0.
+/// Y, U and V as stored, for components of 0 to 255. A block's chroma is the average of its pixels', which
+/// are never negative, rounded down.
 constexpr Yuv FastYuv(Rgb p) {
     return {Floor(4211 * p.r + 8258 * p.g + 1606 * p.b, 16384) + 16,
-            Floor(7193 * p.b - 4768 * p.g - 2425 * p.r, 16384),
-            Floor(7193 * p.r - 6029 * p.g - 1163 * p.b, 16384)};
+            Floor(7193 * p.b - 4768 * p.g - 2425 * p.r, 16384) + 128,
+            Floor(7193 * p.r - 6029 * p.g - 1163 * p.b, 16384) + 128};
 }
 
-/// Y, U and V as stored, for components of 0 to 255.
 constexpr Yuv SimpleYuv(Rgb p) {
     return {Floor(263 * p.r + 516 * p.g + 100 * p.b + 16896, 1024),
             Floor(-152 * p.r - 298 * p.g + 450 * p.b + 131584, 1024),
@@ -48,18 +48,6 @@ constexpr Rgb SimpleRgb(Yuv p) {
     return ClampedRgb(Floor(1192 * p.y + 1634 * p.v - 227712, 1024),
                       Floor(1192 * p.y - 401 * p.u - 833 * p.v + 139392, 1024),
                       Floor(1192 * p.y + 2065 * p.u - 282880, 1024));
-}
-
-/// The stored chroma of a block from the sum of the centred values of its 1, 2 or 4 pixels.
-constexpr int BlockChroma(int sum, int pixels) {
-    switch (pixels) {
-    case 4:
-        return Floor(sum + 512, 4);
-    case 2:
-        return Floor(sum + 256, 2);
-    default:
-        return sum + 128;
-    }
 }
 
 } // namespace equations

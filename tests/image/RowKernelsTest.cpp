@@ -5,7 +5,6 @@
 #include "tests/image/Levels.h"
 
 #include <algorithm>
-#include <memory>
 #include <random>
 #include <vector>
 
@@ -20,12 +19,9 @@ constexpr size_t kMaxWidth = 400;
 
 class RowKernelsTest : public LevelTest {
 protected:
-    RowKernelsTest() {
-        for (auto& memory : sources)
-            memory = std::make_unique<GuardedMemory>(4 * kMaxWidth);
-        for (auto& memory : targets)
-            memory = std::make_unique<GuardedMemory>(4 * kMaxWidth);
-    }
+    struct RowMemory : GuardedMemory {
+        RowMemory() : GuardedMemory(4 * kMaxWidth) {}
+    };
 
     void Fill(std::span<uint8_t> bytes, Content content) {
         for (uint8_t& byte : bytes) {
@@ -40,7 +36,7 @@ protected:
         const auto width = static_cast<size_t>(size.width);
         uint8_t* source[kMaxRows]{};
         for (size_t i = 0; i < kernel.sources.size(); ++i) {
-            const auto block = sources[i]->Block(kernel.sources[i](width), placement);
+            const auto block = sources[i].Block(kernel.sources[i](width), placement);
             Fill(block, content);
             source[i] = block.data();
         }
@@ -48,7 +44,7 @@ protected:
         uint8_t* plainTarget[kMaxRows]{};
         std::vector<uint8_t> plain[kMaxRows];
         for (size_t i = 0; i < kernel.targets.size(); ++i) {
-            const auto block = targets[i]->Block(kernel.targets[i](width), placement);
+            const auto block = targets[i].Block(kernel.targets[i](width), placement);
             Fill(block, content);
             target[i] = block.data();
             plain[i].assign(block.begin(), block.end());
@@ -59,7 +55,7 @@ protected:
         kernel.run(*RowKernelsFor(KernelLevel::kPlain), plainTarget, source, size);
 
         for (size_t i = 0; i < kernel.targets.size(); ++i) {
-            ASSERT_TRUE(targets[i]->GuardsIntact()) << "wrote outside target row " << i;
+            ASSERT_TRUE(targets[i].GuardsIntact()) << "wrote outside target row " << i;
             const auto firstWrong =
                 std::mismatch(plain[i].begin(), plain[i].end(), target[i]).first - plain[i].begin();
             ASSERT_EQ(static_cast<size_t>(firstWrong), plain[i].size())
@@ -92,8 +88,7 @@ protected:
     }
 
     std::mt19937 random{20061};
-    std::unique_ptr<GuardedMemory> sources[kMaxRows];
-    std::unique_ptr<GuardedMemory> targets[kMaxRows];
+    RowMemory sources[kMaxRows], targets[kMaxRows];
 };
 
 TEST_P(RowKernelsTest, EveryWidthOfAFewVectorsAndSomeWiderRows) {

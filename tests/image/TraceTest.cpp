@@ -7,10 +7,9 @@
 #include <cstring>
 #include <functional>
 #include <limits>
+#include <utility>
 
 namespace {
-
-constexpr PictureSize kNothing[] = {{0, 4}, {4, 0}, {-1, 4}, {4, std::numeric_limits<int>::min()}};
 
 VideoImage MakeImage(TestPlanes& planes, int width, int height) {
     VideoImage image{};
@@ -36,19 +35,28 @@ TEST(TraceImage, ReadsNothingButThePicture) {
 }
 
 TEST(TraceImage, LooksAtPlanesOfPlanarPicturesOnly) {
-    TestPlanes planes(4, 4, 0);
-    VideoImage image = MakeImage(planes, 4, 4);
-    image.pY = image.pU = image.pV = nullptr;
-    image.nFormat = 1;
-    xTraceImage(&image);
-    image.nFormat = kPictureFormatPlanar420;
-    image.nType = 3;
-    xTraceImage(&image);
+    VideoImage image{}; // without planes
+    image.nWidth = image.nHeight = 4;
+    for (const auto& [type, format] :
+         {std::pair<int, int>{kMediaTypePicture, 1}, {3, kPictureFormatPlanar420}}) {
+        image.nType = type;
+        image.nFormat = format;
+        xTraceImage(&image);
+    }
+}
+
+TEST(Trace, DoesNothingForASizeOfZeroOrLess) {
+    VideoImage image{};
     image.nType = kMediaTypePicture;
-    for (const PictureSize size : kNothing) {
+    image.nFormat = kPictureFormatPlanar420;
+    tagBITMAPINFO info{};
+    for (const PictureSize size :
+         {PictureSize{0, 4}, {4, 0}, {-1, 4}, {4, std::numeric_limits<int>::min()}}) {
         image.nWidth = size.width;
         image.nHeight = size.height;
         xTraceImage(&image);
+        info.bmiHeader = BitmapHeader(size.width, size.height, 12);
+        xTraceImage(&info, nullptr);
     }
 }
 
@@ -74,14 +82,6 @@ TEST(TraceBitmap, ReadsThePlanesAtOrBehindTheHeader) {
         std::memcpy(packed.Data(), &info.bmiHeader, 40);
         xTraceImage(reinterpret_cast<tagBITMAPINFO*>(packed.Data()), nullptr);
         EXPECT_EQ(std::memcmp(packed.Data(), &info.bmiHeader, 40), 0);
-    }
-}
-
-TEST(TraceBitmap, DoesNothingForASizeOfZeroOrLess) {
-    tagBITMAPINFO info{};
-    for (const PictureSize size : kNothing) {
-        info.bmiHeader = BitmapHeader(size.width, size.height, 12);
-        xTraceImage(&info, nullptr);
     }
 }
 

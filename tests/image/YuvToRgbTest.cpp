@@ -78,49 +78,25 @@ INSTANTIATE_TEST_SUITE_P(Routines, YuvToRgbTest, testing::ValuesIn(kRoutines),
                              return std::string(info.param.name);
                          });
 
-struct Colour {
-    Yuv yuv;
-    Rgb rgb;
-};
-
-TEST(Yuv420_2_rgb24, KnownColours) {
-    const Colour colours[] = {
-        {{16, 128, 128}, {0, 0, 0}},        {{235, 128, 128}, {254, 254, 254}},
-        {{255, 128, 128}, {255, 255, 255}}, {{128, 128, 128}, {130, 130, 130}},
-        {{81, 90, 240}, {254, 0, 0}},       {{235, 16, 16}, {76, 255, 28}},
+TEST(PixelYUV_2_RGB, RoundsClampsAndWrapsAt32Bits) {
+    struct {
+        Yuv yuv;
+        Rgb rgb;
+    } const colours[] = {
+        {{16, 128, 128}, {0, 0, 0}},
+        {{235, 128, 128}, {255, 255, 255}},
+        {{128, 128, 128}, {130, 130, 130}},
+        {{255, 128, 128}, {255, 255, 255}},
+        {{81, 90, 240}, {254, 0, 0}},
+        {{-5000, 128, 128}, {0, 0, 0}},
+        {{1 << 27, 128, 128}, {255, 255, 255}}, // 1192 * 2^27 is 2^30 modulo 2^32
+        {{3 << 26, 128, 128}, {0, 0, 0}},       // 1192 * 3 * 2^26 is -2^29 modulo 2^32
     };
-    for (const Colour& colour : colours) {
-        auto y = static_cast<unsigned char>(colour.yuv.y);
-        auto u = static_cast<unsigned char>(colour.yuv.u);
-        auto v = static_cast<unsigned char>(colour.yuv.v);
-        unsigned char pixel[4]{1, 2, 3, 4};
-        auto header = BitmapHeader(1, 1, 24);
-        Yuv420_2_rgb24(&header, pixel, &y, &u, &v, 1, 1, 1);
-        EXPECT_TRUE(pixel[0] == colour.rgb.b && pixel[1] == colour.rgb.g && pixel[2] == colour.rgb.r &&
-                    pixel[3] == 4)
-            << "Y " << colour.yuv.y;
-    }
-}
-
-TEST(PixelYUV_2_RGB, RoundsAndClamps) {
-    const Colour colours[] = {
-        {{16, 128, 128}, {0, 0, 0}},        {{235, 128, 128}, {255, 255, 255}},
-        {{128, 128, 128}, {130, 130, 130}}, {{255, 128, 128}, {255, 255, 255}},
-        {{81, 90, 240}, {254, 0, 0}},       {{-5000, 128, 128}, {0, 0, 0}},
-    };
-    for (const Colour& colour : colours) {
+    for (const auto& [yuv, rgb] : colours) {
         int r = -1, g = -1, b = -1;
-        PixelYUV_2_RGB(colour.yuv.y, colour.yuv.u, colour.yuv.v, r, g, b);
-        EXPECT_TRUE(r == colour.rgb.r && g == colour.rgb.g && b == colour.rgb.b) << "Y " << colour.yuv.y;
+        PixelYUV_2_RGB(yuv.y, yuv.u, yuv.v, r, g, b);
+        EXPECT_TRUE(r == rgb.r && g == rgb.g && b == rgb.b) << "Y " << yuv.y;
     }
-}
-
-TEST(PixelYUV_2_RGB, WrapsAt32Bits) {
-    int r = -1, g = -1, b = -1;
-    PixelYUV_2_RGB(1 << 27, 128, 128, r, g, b); // 1192 * 2^27 is 2^30 modulo 2^32
-    EXPECT_EQ(r, 255);
-    PixelYUV_2_RGB(3 << 26, 128, 128, r, g, b); // 1192 * 3 * 2^26 is -2^29 modulo 2^32
-    EXPECT_EQ(r, 0);
 }
 
 } // namespace
