@@ -116,6 +116,4 @@ inline std::vector<PictureSize> PictureSizes() {
     return sizes;
 }
 
-inline constexpr int kPaddings[] = {0, 1, 5};
-
 #endif
