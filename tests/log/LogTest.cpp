@@ -71,14 +71,9 @@ TEST(Replace, Table) {
     } const cases[] = {
         {"a%20b%20", "%20", ' ', "a b ", 2},
         {"aaa", "aa", 'X', "Xa", 1},
-        {"aaaa", "aa", 'X', "XX", 2},
         {"aaaa", "aa", 'a', "aa", 2},
-        {"plain", "%20", ' ', "plain", 0},
         {"", "%20", ' ', "", 0},
-        {"%2", "%20", ' ', "%2", 0},
-        {"%20", "%20", ' ', " ", 1},
         {"%220%20%2", "%20", ' ', "%220 %2", 1},
-        {"x/y/z", "/", ':', "x:y:z", 2},
     };
     for (const auto& row : cases) {
         std::string text = row.text;
@@ -95,22 +90,17 @@ TEST_F(Logging, DirectoryTable) {
         {"file://localhost/Applications/My%20App.app/", "/Applications/My App.app/Contents/MacOS"},
         {"file://localhost/usr/local/bin/", "/usr/local/bin"},
         {"file:///Applications/X.app/", "file:///Applications/X.app/Contents/MacOS"},
-        {"file:///usr/bin/", "file:///usr/bin"},
         {"file://localhost/", ""},
         {"file://localhost/%20%41%c3/", "/ %41%c3"},
         {"xyzfile://localhost/bin/", "ost/bin"}, // 16 characters are left out wherever the text was found
-        {"file://localhost/.app/", "/.app/Contents/MacOS"},
         {".app/", ".app/Contents/MacOS"},
         {"app/", "app"},
         {"a", ""},
         {"", ""},
         {localhost + "/" + std::string(492, 'd') + "/", "/" + std::string(492, 'd')},
         {localhost + "/" + std::string(493, 'd') + "/", ""}, // 511 bytes: too long for the URL's buffer
-        {localhost + "/" + std::string(476, 'd') + ".app/",
-         "/" + std::string(476, 'd') + ".app/Contents/MacOS"},
         {std::string(491, 'd') + ".app/", std::string(491, 'd') + ".app/Contents/MacOS"},
         {std::string(492, 'd') + ".app/", ""},
-        {std::string(505, 'd') + ".app/", ""},
     };
     for (const auto& [url, path] : cases) {
         g_bundle.url = url;
@@ -140,7 +130,6 @@ TEST_F(Logging, LinesReachTheSink) {
         EXPECT_EQ(LastLine(), L"MovieConv::5 wide \u20ac 1.500000 narrow\r\n");
         EXPECT_EQ(Log(L"100%s %d"), 2);
         EXPECT_EQ(LastLine(), L"100%s %d");
-        EXPECT_EQ(LogEx(L""), 0);
         EXPECT_EQ(LogEx(L"%ls", L""), 0);
         EXPECT_EQ(LastLine(), L"100%s %d");
         EXPECT_EQ(Log(L""), 3);
@@ -151,23 +140,22 @@ TEST_F(Logging, LinesReachTheSink) {
         EXPECT_EQ(LogEx(L"%lsy", fits.c_str()), 5);
         EXPECT_EQ(LastLine().substr(0, 1022), fits.substr(0, 1022));
         EXPECT_LE(LastLine().size(), 1023U);
-        EXPECT_EQ(LogEx(L"%100000d", 1), 6);
-        EXPECT_LE(LastLine().size(), 1023U);
-        EXPECT_NE(dyLogInit(), nullptr);
-        EXPECT_EQ(dyLogInit(), dyLogInit());
     });
     EXPECT_EQ(printed, "");
 }
 
-TEST_F(Logging, WithoutASinkOnlyTheFirstLineTellsThePath) {
+TEST_F(Logging, WithoutASinkThePathIsToldOnceAndWhatIsLookedUpEachTime) {
     const std::string printed = PrintedBy([this] {
         EXPECT_EQ(LogEx(L"%d", 1), 0);
         PutSink(recording_sink); // too late: it is not looked for again
-        EXPECT_EQ(Log(L"two"), 0);
         EXPECT_EQ(dyLogInit(), nullptr);
+        for (const std::intptr_t ordinal : {1, 65535}) // shown as numbers
+            EXPECT_EQ(LogGetAddress(reinterpret_cast<const char*>(ordinal)), nullptr);
     });
-    const std::string lookup = "dyLog.h: LogGetAddress [Log] [0x0] error.\r\n";
-    EXPECT_EQ(printed, "dyLog.h: dlopen [" + SinkPath() + "] error.\r\n" + lookup + lookup);
+    std::string expected = "dyLog.h: dlopen [" + SinkPath() + "] error.\r\n";
+    for (const char* name : {"Log", "1", "65535"})
+        expected.append("dyLog.h: LogGetAddress [").append(name).append("] [0x0] error.\r\n");
+    EXPECT_EQ(printed, expected);
 }
 
 TEST_F(Logging, ALibraryWithoutTheEntryIsToldByItsHandle) {
@@ -182,16 +170,6 @@ TEST_F(Logging, ALibraryWithoutTheEntryIsToldByItsHandle) {
     ASSERT_EQ(printed.rfind(start, 0), 0U) << printed;
     const std::string shown = printed.substr(printed.rfind('\n') + 1);
     EXPECT_EQ(printed, start + shown + "] error.\r\n" + shown);
-}
-
-TEST_F(Logging, SmallOrdinalsAreShownAsNumbers) {
-    const std::string printed = PrintedBy([] {
-        dyLogInit();
-        for (const std::intptr_t ordinal : {1, 65535})
-            EXPECT_EQ(LogGetAddress(reinterpret_cast<const char*>(ordinal)), nullptr);
-    });
-    EXPECT_EQ(printed.substr(printed.find('\n') + 1), "dyLog.h: LogGetAddress [1] [0x0] error.\r\n"
-                                                      "dyLog.h: LogGetAddress [65535] [0x0] error.\r\n");
 }
 
 TEST_F(Logging, APathThatDoesNotFitGivesUp) {
@@ -211,10 +189,7 @@ TEST_F(Logging, TwoThreadsMayLogFirst) {
         const std::string printed = PrintedBy([] {
             std::vector<std::thread> threads;
             for (int i = 0; i < 2; ++i)
-                threads.emplace_back([] {
-                    for (int line = 0; line < 50; ++line)
-                        EXPECT_GT(reinterpret_cast<std::uintptr_t>(LogGetAddress("Log")), 0U);
-                });
+                threads.emplace_back([] { EXPECT_NE(LogGetAddress("Log"), nullptr); });
             for (std::thread& thread : threads)
                 thread.join();
             EXPECT_EQ(Log(L"whole"), 1);
