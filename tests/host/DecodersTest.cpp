@@ -123,9 +123,8 @@ INSTANTIATE_TEST_SUITE_P(Movies, DecodersSeek, testing::ValuesIn(kSeekCases),
 TEST(Decoders, DoNotCountTheFrameThatASeekCutsAsDamaged) {
     Movie movie(Make("counted.mpg", Join(CountedPictures(4), Beeps(4), Args{"-c:v", "mpeg2video"})), {});
     TakeAll(movie, 1.23);
-    for (const std::string& complaint : movie.Complaints()) {
+    for (const std::string& complaint : movie.Complaints())
         EXPECT_EQ(complaint.find("damaged"), std::string::npos) << complaint;
-    }
 }
 
 TEST(Decoders, KeepTheStampsOfAVariableRate) {
@@ -308,9 +307,8 @@ TEST(Decoders, GiveWhatATruncatedMovieHolds) {
     const Seen seen = TakeAll(movie);
     EXPECT_GT(seen.pictures.size(), 40u);
     EXPECT_LT(seen.pictures.size(), 80u);
-    for (size_t i = 0; i + 1 < seen.pictures.size(); ++i) {
+    for (size_t i = 0; i + 1 < seen.pictures.size(); ++i)
         EXPECT_NEAR(seen.pictures[i].luma, LumaOf(static_cast<int>(i)), 2) << i;
-    }
     EXPECT_NEAR(movie.Info().duration, static_cast<double>(seen.pictures.size()) / 25, 0.3);
 }
 
@@ -329,16 +327,14 @@ TEST(Decoders, SayWhyAMovieWithoutItsIndexCannotBeOpened) {
 TEST(Decoders, SkipDamagedDataAndKeepTime) {
     const Folder folder;
     std::string bytes = ReadFile(CountedTs());
-    for (std::size_t at = bytes.size() / 3; at < bytes.size() / 3 + 6000; at += 40) {
+    for (std::size_t at = bytes.size() / 3; at < bytes.size() / 3 + 6000; at += 40)
         bytes[at] = '\x55';
-    }
     WriteFile(folder / "damaged.ts", bytes);
     Movie movie(folder / "damaged.ts", {});
     const Seen seen = TakeAll(movie);
     EXPECT_GT(seen.pictures.size(), 60u);
-    for (size_t i = 1; i < seen.pictures.size(); ++i) {
+    for (size_t i = 1; i < seen.pictures.size(); ++i)
         EXPECT_GT(seen.pictures[i].time, seen.pictures[i - 1].time) << i;
-    }
     EXPECT_NEAR(seen.pictures.back().time, 3.96, 0.05);
     const std::vector<double> beeps = Beginnings(seen, 44100);
     ASSERT_FALSE(beeps.empty());
@@ -441,9 +437,8 @@ TEST(Decoders, RefuseWhatIsNoMovie) {
     const Folder folder;
     WriteFile(folder / "text.mp4", "this is no movie\n");
     WriteFile(folder / "empty.mp4", "");
-    for (const char* name : {"text.mp4", "empty.mp4", "missing.mp4"}) {
+    for (const char* name : {"text.mp4", "empty.mp4", "missing.mp4"})
         EXPECT_THROW(Movie(folder / name, {}), host::SourceError) << name;
-    }
 }
 
 } // namespace

@@ -9,25 +9,21 @@ namespace {
 
 int MeanLuma(const VideoImage& image) {
     int64_t sum = 0;
-    for (int y = 0; y < image.nHeight; ++y) {
-        for (int x = 0; x < image.nWidth; ++x) {
+    for (int y = 0; y < image.nHeight; ++y)
+        for (int x = 0; x < image.nWidth; ++x)
             sum += image.pY[static_cast<ptrdiff_t>(y) * image.nPitchY + x];
-        }
-    }
     return static_cast<int>(std::lround(static_cast<double>(sum) / image.nWidth / image.nHeight));
 }
 
 void TakeSound(AudioDecoder& decoder, Seen& seen) {
     int64_t samples = 0;
     while (const AudioFrame* block = decoder.GetNextFrame()) {
-        if (block->nLength == 0) {
+        if (block->nLength == 0)
             break;
-        }
         const int sampleBytes = block->nBitsPerSample / 8;
         const int count = block->nLength / sampleBytes / block->nChannels;
-        if (samples == 0) {
+        if (samples == 0)
             seen.soundBegin = static_cast<double>(block->llTime) / 1e7;
-        }
         const double due = seen.soundBegin + static_cast<double>(samples) / block->nSampleRate;
         seen.soundContinuous =
             seen.soundContinuous && std::abs(static_cast<double>(block->llTime) / 1e7 - due) < 1e-6;
@@ -49,25 +45,21 @@ Seen TakeAll(host::Movie& movie, double begin) {
     Seen seen;
     VideoDecoder* pictures = movie.Pictures();
     AudioDecoder* sound = movie.Sound();
-    if (begin > 0 && pictures != nullptr) {
+    if (begin > 0 && pictures != nullptr)
         pictures->Seek(begin, 1);
-    }
-    if (begin > 0 && sound != nullptr) {
+    if (begin > 0 && sound != nullptr)
         sound->Seek(begin);
-    }
     if (pictures != nullptr) {
         for (const VideoImage* image = pictures->GetCurrentImage(); image != nullptr;
              image = pictures->GetCurrentImage()) {
             seen.pictures.push_back({static_cast<double>(image->llTime) / 1e7, image->nDuration / 1e7,
                                      MeanLuma(*image), image->nWidth, image->nHeight});
-            if (pictures->DecodeNext(1) < 1) {
+            if (pictures->DecodeNext(1) < 1)
                 break;
-            }
         }
     }
-    if (sound != nullptr) {
+    if (sound != nullptr)
         TakeSound(*sound, seen);
-    }
     return seen;
 }
 
@@ -76,9 +68,8 @@ std::vector<double> Beginnings(const Seen& seen, int rate) {
     int64_t lastLoud = -rate;
     for (size_t i = 0; i < seen.sound.size(); ++i) {
         if (std::abs(seen.sound[i]) > 3000) {
-            if (static_cast<int64_t>(i) - lastLoud > rate * 3 / 10) {
+            if (static_cast<int64_t>(i) - lastLoud > rate * 3 / 10)
                 times.push_back(seen.soundBegin + static_cast<double>(i) / rate);
-            }
             lastLoud = static_cast<int64_t>(i);
         }
     }
@@ -91,9 +82,8 @@ std::vector<double> Flashes(const Seen& seen) {
     bool wasBright = false;
     for (const SeenPicture& picture : seen.pictures) {
         const bool bright = picture.luma > kBright;
-        if (bright && !wasBright) {
+        if (bright && !wasBright)
             times.push_back(picture.time);
-        }
         wasBright = bright;
     }
     return times;

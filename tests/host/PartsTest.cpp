@@ -25,17 +25,14 @@ TEST(Units, ReadRatesSizesAndFrameRates) {
     EXPECT_EQ(ParseRate("512000"), 512000);
     EXPECT_EQ(ParseRate("1.5M"), 1'500'000);
     EXPECT_EQ(ParseRate("128k"), 128'000);
-    for (const char* text : {"0", "-5k", "k", "5000M", "12q"}) {
+    for (const char* text : {"0", "-5k", "k", "5000M", "12q"})
         EXPECT_EQ(ParseRate(text), std::nullopt) << text;
-    }
     EXPECT_EQ(ParseSize("640x360")->height, 360);
-    for (const char* text : {"640", "x360", "640x", "1x1", "640x360x2", "99999x2", "-4x4"}) {
+    for (const char* text : {"640", "x360", "640x", "1x1", "640x360x2", "99999x2", "-4x4"})
         EXPECT_FALSE(ParseSize(text)) << text;
-    }
     EXPECT_DOUBLE_EQ(*ParseFrameRate("30000/1001"), 30000.0 / 1001);
-    for (const char* text : {"0", "25/0", "1000", "/5", "a"}) {
+    for (const char* text : {"0", "25/0", "1000", "/5", "a"})
         EXPECT_EQ(ParseFrameRate(text), std::nullopt) << text;
-    }
 }
 
 TEST(Units, WriteTimesAndSizes) {
@@ -63,13 +60,11 @@ TEST(WorkClock, LeavesPausesAndSuspensionOut) {
 TEST(SpeedMeter, FollowsTheLastTenSeconds) {
     SpeedMeter meter;
     EXPECT_FALSE(meter.Speed());
-    for (int i = 0; i <= 20; ++i) {
+    for (int i = 0; i <= 20; ++i)
         meter.Add(i, i);
-    }
     EXPECT_NEAR(*meter.Speed(), 1, 1e-9);
-    for (int i = 1; i <= 11; ++i) {
+    for (int i = 1; i <= 11; ++i)
         meter.Add(20 + i, 20 + 4 * i);
-    }
     EXPECT_NEAR(*meter.Speed(), 4, 0.3);
     EXPECT_NEAR(*meter.Left(104), 10, 1);
     EXPECT_EQ(*meter.Left(1), 0);
@@ -85,9 +80,8 @@ TEST(ProgressText, FitsTheTerminalAndNeverRoundsUp) {
     report.bytes = 1'234'567;
     const std::string text = ProgressText(report, 1000);
     EXPECT_EQ(text, " 42.9%  0:01:01 / 1:00:00   3.50x  left 0:01:00  1.2 MB");
-    for (int columns = 10; columns < 60; ++columns) {
+    for (int columns = 10; columns < 60; ++columns)
         EXPECT_LT(ProgressText(report, columns).size(), static_cast<std::size_t>(columns));
-    }
     report.percent.reset();
     EXPECT_EQ(ProgressText(report, 1000).find('%'), std::string::npos);
     report.phase = Phase::kWaitingForRoom;

@@ -16,9 +16,8 @@ namespace {
 
 [[noreturn]] void Become(const std::vector<std::string>& command) {
     std::vector<char*> argv;
-    for (const std::string& argument : command) {
+    for (const std::string& argument : command)
         argv.push_back(const_cast<char*>(argument.c_str()));
-    }
     argv.push_back(nullptr);
     execvp(argv[0], argv.data());
     _exit(127);
@@ -36,9 +35,8 @@ int Code(int status) {
 std::string ReadAll(std::FILE* file) {
     std::rewind(file);
     std::string text;
-    for (int c = std::fgetc(file); c != EOF; c = std::fgetc(file)) {
+    for (int c = std::fgetc(file); c != EOF; c = std::fgetc(file))
         text += static_cast<char>(c);
-    }
     std::fclose(file);
     return text;
 }
@@ -75,9 +73,8 @@ Running::Running(const std::vector<std::string>& arguments, bool terminal) {
         return;
     }
     int ends[2] = {-1, -1};
-    if (pipe2(ends, O_CLOEXEC) != 0) {
+    if (pipe2(ends, O_CLOEXEC) != 0)
         return;
-    }
     child_ = fork();
     if (child_ == 0) {
         dup2(open("/dev/null", O_RDONLY), 0);
@@ -99,9 +96,8 @@ Running::~Running() {
 bool Running::ReadSome() {
     char buffer[4096];
     const ssize_t count = read(output_, buffer, sizeof buffer);
-    if (count > 0) {
+    if (count > 0)
         printed_.append(buffer, static_cast<std::size_t>(count));
-    }
     return count > 0; // a terminal whose program has ended gives an error
 }
 
@@ -114,13 +110,11 @@ bool Running::WaitFor(const std::string& pattern) {
     regmatch_t match{};
     const auto matches = [&] { return regexec(&regex, printed_.c_str() + seen_, 1, &match, 0) == 0; };
     bool found = matches();
-    while (!found && ReadSome()) {
+    while (!found && ReadSome())
         found = matches();
-    }
     regfree(&regex);
-    if (found) {
+    if (found)
         seen_ += static_cast<std::size_t>(match.rm_eo);
-    }
     return found;
 }
 
@@ -139,9 +133,8 @@ void Running::Signal(int signal) const {
 }
 
 void Running::Press(const std::string& keys) const {
-    if (write(output_, keys.data(), keys.size()) != static_cast<ssize_t>(keys.size())) {
+    if (write(output_, keys.data(), keys.size()) != static_cast<ssize_t>(keys.size()))
         std::perror("cannot press a key");
-    }
 }
 
 Result Running::Finish() {

@@ -48,9 +48,8 @@ std::size_t FlashesInStep(const std::string& path) {
     const std::vector<double> light = Flashes(seen);
     const std::vector<double> sound = Beginnings(seen, movie.Info().sound->sampleRate);
     EXPECT_EQ(light.size(), sound.size()) << path;
-    for (std::size_t i = 0; i < std::min(light.size(), sound.size()); ++i) {
+    for (std::size_t i = 0; i < std::min(light.size(), sound.size()); ++i)
         EXPECT_NEAR(light[i], sound[i], 0.025) << path << ", flash " << i;
-    }
     return light.size();
 }
 
@@ -322,9 +321,8 @@ class ProgramSignal : public testing::TestWithParam<int> {};
 TEST_P(ProgramSignal, FinishesAPlayableFile) {
     const Folder folder;
     Running running(Join(Slowly(folder / "out.mp4"), Args{"--progress", "json"}), false);
-    for (int report = 0; report < 4; ++report) {
+    for (int report = 0; report < 4; ++report)
         ASSERT_TRUE(running.WaitFor("\"event\":\"progress\""));
-    }
     running.Signal(GetParam());
     const Result result = running.Finish();
     EXPECT_EQ(result.code, 6) << result.out;
@@ -445,9 +443,8 @@ public:
         mounted_ = mount("tmpfs", path.c_str(), "tmpfs", 0, "size=600k") == 0;
     }
     ~SmallDisk() {
-        if (mounted_) {
+        if (mounted_)
             umount2(path_.c_str(), MNT_DETACH);
-        }
     }
     SmallDisk(const SmallDisk&) = delete;
     SmallDisk& operator=(const SmallDisk&) = delete;
@@ -462,9 +459,8 @@ private:
 TEST(Program, SaysThatTheDiskIsFullAndKeepsWhatIsDone) {
     const Folder folder;
     const SmallDisk disk(folder / "disk");
-    if (!disk.IsThere()) {
+    if (!disk.IsThere())
         GTEST_SKIP() << "no small disk can be mounted here";
-    }
     const Args making{Minute(), folder / "disk/out.mov", "--audio-codec", "PCM"};
     const Result result = Call(making);
     EXPECT_EQ(result.code, 5) << result.err;
@@ -485,9 +481,8 @@ TEST(Program, SaysThatTheDiskIsFullAndKeepsWhatIsDone) {
 TEST(Program, WaitsForRoomWhenAsked) {
     const Folder folder;
     const SmallDisk disk(folder / "disk");
-    if (!disk.IsThere()) {
+    if (!disk.IsThere())
         GTEST_SKIP() << "no small disk can be mounted here";
-    }
     Running running({Minute(), folder / "disk/out.mov", "--audio-codec", "PCM", "--on-full", "wait",
                      "--progress", "json"},
                     false);

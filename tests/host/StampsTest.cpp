@@ -18,14 +18,11 @@ constexpr std::optional<int64_t> kNone;
 std::vector<int64_t> Repair(const std::vector<std::optional<int64_t>>& stamps, int expectedRepairs) {
     StampRepair repair(kStep);
     std::vector<int64_t> times;
-    for (const auto& stamp : stamps) {
-        if (const auto settled = repair.Push(stamp)) {
+    for (const auto& stamp : stamps)
+        if (const auto settled = repair.Push(stamp))
             times.push_back(settled->time);
-        }
-    }
-    if (const auto last = repair.Finish()) {
+    if (const auto last = repair.Finish())
         times.push_back(last->time);
-    }
     EXPECT_EQ(repair.Repaired(), expectedRepairs);
     return times;
 }

@@ -64,10 +64,9 @@ const AudioFrame& TestSound::Next(int samples, int64_t time) {
         auto wide = static_cast<int32_t>(std::lround(value * 2147483647.0));
         if (size == 1)
             wide ^= INT32_MIN;
-        for (int channel = 0; channel < frame_.nChannels; ++channel) {
+        for (int channel = 0; channel < frame_.nChannels; ++channel)
             for (int byte = 4 - size; byte < 4; ++byte)
                 data_.push_back(static_cast<unsigned char>(static_cast<uint32_t>(wide) >> (8 * byte)));
-        }
     }
     frame_.pData = data_.data();
     frame_.nLength = frame_.nBufferSize = static_cast<int32_t>(data_.size());
