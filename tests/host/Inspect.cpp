@@ -63,6 +63,11 @@ Seen TakeAll(host::Movie& movie, double begin) {
     return seen;
 }
 
+Seen LookAt(const std::string& path, double begin) {
+    host::Movie movie(path, {});
+    return TakeAll(movie, begin);
+}
+
 std::vector<double> Beginnings(const Seen& seen, int rate) {
     std::vector<double> times;
     int64_t lastLoud = -rate;

@@ -5,6 +5,7 @@
 #include "host/Movie.h"
 
 #include <cstdint>
+#include <string>
 #include <vector>
 
 namespace inspect {
@@ -28,6 +29,7 @@ struct Seen {
 /// Everything from `begin` on, pictures first: the decoders must not depend on an even interleaving of the
 /// calls.
 Seen TakeAll(host::Movie& movie, double begin = 0);
+Seen LookAt(const std::string& path, double begin = 0);
 
 /// Times at which the sound becomes loud after at least 0.3 s of quiet.
 std::vector<double> Beginnings(const Seen& seen, int rate);

@@ -9,7 +9,7 @@
 
 namespace test_movies {
 
-std::string Make(const std::string& name, const std::vector<std::string>& arguments) {
+std::string Make(const std::string& name, const Args& arguments) {
     namespace fs = std::filesystem;
     const fs::path folder = MOVIECONV_TEST_MOVIES;
     const fs::path path = folder / name;
@@ -17,30 +17,29 @@ std::string Make(const std::string& name, const std::vector<std::string>& argume
         fs::create_directories(folder);
         // Tests run in parallel: each makes its own and the last one stays.
         const fs::path mine = folder / fmt::format("{}-{}", getpid(), name);
-        const program::Result result =
-            program::Run(Join(std::vector<std::string>{"ffmpeg", "-v", "error", "-nostdin", "-y"}, arguments,
-                              std::vector<std::string>{mine.string()}));
+        const program::Result result = program::Run(
+            Join(Args{"ffmpeg", "-v", "error", "-nostdin", "-y"}, arguments, Args{mine.string()}));
         EXPECT_EQ(result.code, 0) << "ffmpeg could not make " << name << ": " << result.err;
         fs::rename(mine, path);
     }
     return path.string();
 }
 
-std::vector<std::string> CountedPictures(double seconds, const std::string& rate) {
+Args CountedPictures(double seconds, const std::string& rate) {
     return {
         "-f", "lavfi", "-i",
         fmt::format("color=gray:s=160x120:r={}:d={},format=yuv420p,geq=lum='20+mod(N,{})*4':cb=128:cr=128",
                     rate, seconds, kCountedLumas)};
 }
 
-std::vector<std::string> FlashPictures(double seconds) {
+Args FlashPictures(double seconds) {
     return {"-f", "lavfi", "-i",
             fmt::format("color=black:s=160x120:r=25:d={},format=yuv420p,"
                         "drawbox=c=white:t=fill:enable='lt(mod(t,1),0.079)'",
                         seconds)};
 }
 
-std::vector<std::string> Beeps(double seconds) {
+Args Beeps(double seconds) {
     return {"-f", "lavfi", "-i",
             fmt::format("aevalsrc='if(lt(mod(t,1),0.08),0.8*sin(2*PI*1000*t),0)':s=44100:d={}", seconds)};
 }

@@ -9,16 +9,18 @@
 
 namespace test_movies {
 
+using Args = std::vector<std::string>;
+
 /// The path of the movie `name`, made with `ffmpeg ARGUMENTS PATH` unless it exists. Fails the test when it
 /// cannot be.
-std::string Make(const std::string& name, const std::vector<std::string>& arguments);
+std::string Make(const std::string& name, const Args& arguments);
 
 /// ffmpeg arguments for pictures of 160 x 120 whose brightness counts them: picture n has luma LumaOf(n).
-std::vector<std::string> CountedPictures(double seconds, const std::string& rate = "25");
+Args CountedPictures(double seconds, const std::string& rate = "25");
 /// ffmpeg arguments for white flashes of 80 ms at every whole second.
-std::vector<std::string> FlashPictures(double seconds);
+Args FlashPictures(double seconds);
 /// ffmpeg arguments for beeps of 80 ms at every whole second.
-std::vector<std::string> Beeps(double seconds);
+Args Beeps(double seconds);
 
 constexpr int kCountedLumas = 50;
 constexpr int LumaOf(int picture) {
@@ -26,8 +28,8 @@ constexpr int LumaOf(int picture) {
 }
 
 template <class... Lists>
-std::vector<std::string> Join(Lists... lists) {
-    std::vector<std::string> all;
+Args Join(Lists... lists) {
+    Args all;
     (all.insert(all.end(), lists.begin(), lists.end()), ...);
     return all;
 }
