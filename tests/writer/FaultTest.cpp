@@ -85,11 +85,19 @@ protected:
         movie_.pictures = 100;
         movie_.soundSeconds = 4;
         movie_.param.nVideoBitrate = 2'000'000;
+        options_.pContext = this;
+        options_.pfnListener = [](void* context, int event, const WriterStatus*) {
+            if (event != kWriterEventFinishing)
+                static_cast<Fault*>(context)->events_.push_back(event);
+        };
     }
     ~Fault() override { MWSetWriterOptions(nullptr); }
 
-    Outcome Run(Faults& faults) {
-        FaultyFiles files(faults);
+    Outcome Run() {
+        MWSetWriterOptions(&options_);
+        events_.clear();
+        faults_.writes = 0;
+        FaultyFiles files(faults_);
         const VideoFormat video = movie_.Video();
         const AudioFormat audio = movie_.Audio();
         const auto record = writer::StatusBoard::Instance().Open(path_);
@@ -107,13 +115,6 @@ protected:
         return outcome;
     }
 
-    /// Writes of a whole file without any fault.
-    int CountWrites() {
-        Faults faults;
-        EXPECT_TRUE(Run(faults).complete);
-        return faults.writes;
-    }
-
     static void ExpectPlayablePart(const Outcome& outcome) {
         const std::string part = outcome.status.szTemporaryPath;
         ASSERT_FALSE(part.empty());
@@ -128,6 +129,10 @@ protected:
     Folder folder_;
     std::string path_ = folder_ / "movie";
     TestMovie movie_;
+    Faults faults_;
+    WriterOptions options_{};
+    std::vector<int> events_;
+    int asked_ = 0; ///< For more room.
 };
 
 struct Disk {
@@ -141,15 +146,15 @@ class FaultIn : public Fault, public testing::WithParamInterface<Disk> {};
 TEST_P(FaultIn, EveryWriteIsToldAndLeavesAPlayablePart) {
     movie_.param.fccFileFormat = GetParam().format;
     movie_.param.fccAudio = FourCC("MP3 ");
-    const int writes = CountWrites();
+    ASSERT_TRUE(Run().complete);
+    const int writes = faults_.writes;
     ASSERT_GT(writes, 1);
+    faults_.writeError = GetParam().error;
     for (int number = 0; number < writes; ++number) {
         SCOPED_TRACE("write " + std::to_string(number));
         WriteFile(path_, "earlier");
-        Faults faults;
-        faults.failingWrite = number;
-        faults.writeError = GetParam().error;
-        const Outcome outcome = Run(faults);
+        faults_.failingWrite = number;
+        const Outcome outcome = Run();
         if (outcome.complete) {
             // The data was whole in the temporary file, only its tidier form found no room.
             EXPECT_EQ(ReadMovieFile(path_).pictures.size(), 100U);
@@ -164,6 +169,7 @@ TEST_P(FaultIn, EveryWriteIsToldAndLeavesAPlayablePart) {
                   std::string::npos);
         if (outcome.created) {
             EXPECT_EQ(outcome.status.nState, kWriterFileFailed);
+            EXPECT_EQ(events_, (std::vector<int>{kWriterEventFailed, kWriterEventClosed}));
             ExpectPlayablePart(outcome);
             std::filesystem::remove(outcome.status.szTemporaryPath);
         }
@@ -181,9 +187,9 @@ INSTANTIATE_TEST_SUITE_P(
 
 TEST_F(Fault, SyncAndRenameKeepTheDataUnderItsTemporaryName) {
     for (int Faults::*where : {&Faults::syncError, &Faults::renameError}) {
-        Faults faults;
-        faults.*where = EIO;
-        const Outcome outcome = Run(faults);
+        faults_.syncError = faults_.renameError = 0;
+        faults_.*where = EIO;
+        const Outcome outcome = Run();
         EXPECT_FALSE(outcome.complete);
         EXPECT_EQ(outcome.status.nError, kWriterErrorFinish);
         EXPECT_EQ(outcome.status.nSystemError, EIO);
@@ -195,55 +201,26 @@ TEST_F(Fault, SyncAndRenameKeepTheDataUnderItsTemporaryName) {
 }
 
 TEST_F(Fault, APartialFileIsRemovedWhenTheHostWantsThat) {
-    WriterOptions options{};
-    options.bRemovePartial = 1;
-    MWSetWriterOptions(&options);
-    Faults faults;
-    faults.failingWrite = 3;
-    const Outcome outcome = Run(faults);
+    options_.bRemovePartial = 1;
+    faults_.failingWrite = 3;
+    const Outcome outcome = Run();
     EXPECT_FALSE(outcome.complete);
     EXPECT_EQ(std::string(outcome.status.szTemporaryPath), "");
     EXPECT_TRUE(folder_.Names().empty());
 }
 
 TEST_F(Fault, AFullDiskCanBeWaitedFor) {
-    struct Host {
-        Faults* faults;
-        int asked;
-    };
-    Faults faults;
-    faults.failingWrite = 3;
-    Host host{&faults, 0};
-    WriterOptions options{};
-    options.pContext = &host;
-    options.pfnFullDisk = [](void* context, const WriterStatus* status) {
-        auto* self = static_cast<Host*>(context);
+    faults_.failingWrite = 3;
+    options_.pfnFullDisk = [](void* context, const WriterStatus* status) {
+        auto* self = static_cast<Fault_AFullDiskCanBeWaitedFor_Test*>(context);
         EXPECT_NE(std::string(status->szTemporaryPath), "");
-        if (++self->asked == 3)
-            self->faults->failingWrite = -1; // There is room again.
+        if (++self->asked_ == 3)
+            self->faults_.failingWrite = -1; // There is room again.
         return 1;
     };
-    MWSetWriterOptions(&options);
-    EXPECT_TRUE(Run(faults).complete);
-    EXPECT_EQ(host.asked, 3);
+    EXPECT_TRUE(Run().complete);
+    EXPECT_EQ(asked_, 3);
     EXPECT_EQ(ReadMovieFile(path_).pictures.size(), 100U);
-}
-
-TEST_F(Fault, TheListenerHearsOfItOnceWhileTheConversionGoesOn) {
-    std::vector<int> events;
-    WriterOptions options{};
-    options.pContext = &events;
-    options.pfnListener = [](void* context, int event, const WriterStatus*) {
-        if (event != kWriterEventFinishing)
-            static_cast<std::vector<int>*>(context)->push_back(event);
-    };
-    MWSetWriterOptions(&options);
-    Faults faults;
-    faults.failingWrite = 2;
-    faults.writeError = EIO;
-    const Outcome outcome = Run(faults);
-    EXPECT_EQ(outcome.status.nError, kWriterErrorWrite);
-    EXPECT_EQ(events, (std::vector<int>{kWriterEventFailed, kWriterEventClosed}));
 }
 
 TEST_F(Fault, NeitherFilesNorThreadsAreLeftBehind) {
@@ -251,9 +228,8 @@ TEST_F(Fault, NeitherFilesNorThreadsAreLeftBehind) {
     movie_.soundSeconds = 0.4;
     const auto runAll = [&] {
         for (const int failing : {-1, 0, 1}) {
-            Faults faults;
-            faults.failingWrite = failing;
-            Run(faults);
+            faults_.failingWrite = failing;
+            Run();
         }
         MWCloseMediaFile(movie_.Create(folder_ / "no/such/folder/movie"), nullptr, nullptr);
     };
