@@ -28,34 +28,13 @@ std::vector<std::string> Movieconv(std::vector<std::string> arguments) {
     return arguments;
 }
 
-int Code(int status) {
-    return WIFEXITED(status) ? WEXITSTATUS(status) : 128 + WTERMSIG(status);
-}
-
-std::string ReadAll(std::FILE* file) {
-    std::rewind(file);
-    std::string text;
-    for (int c = std::fgetc(file); c != EOF; c = std::fgetc(file))
-        text += static_cast<char>(c);
-    std::fclose(file);
-    return text;
-}
-
 } // namespace
 
 Result Run(const std::vector<std::string>& command) {
-    std::FILE* out = std::tmpfile();
-    std::FILE* err = std::tmpfile();
-    const pid_t child = fork();
-    if (child == 0) {
+    return InChild([&]() -> int {
         dup2(open("/dev/null", O_RDONLY), 0);
-        dup2(fileno(out), 1);
-        dup2(fileno(err), 2);
         Become(command);
-    }
-    int status = 0;
-    waitpid(child, &status, 0);
-    return {Code(status), ReadAll(out), ReadAll(err)};
+    });
 }
 
 Result Call(const std::vector<std::string>& arguments) {
@@ -140,10 +119,9 @@ void Running::Press(const std::string& keys) const {
 Result Running::Finish() {
     while (ReadSome()) {
     }
-    int status = 0;
-    waitpid(child_, &status, 0);
+    const int code = AwaitEnd(child_);
     child_ = -1;
-    return {Code(status), printed_, {}};
+    return {code, printed_, {}};
 }
 
 } // namespace program

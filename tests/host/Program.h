@@ -2,17 +2,15 @@
 #ifndef MOVIECONV_TESTS_HOST_PROGRAM_H
 #define MOVIECONV_TESTS_HOST_PROGRAM_H
 
+#include "tests/support/Process.h"
+
 #include <string>
 #include <sys/types.h>
 #include <vector>
 
 namespace program {
 
-struct Result {
-    int code; ///< Exit code, or 128 plus the signal that ended it.
-    std::string out;
-    std::string err;
-};
+using Result = ProcessResult;
 
 /// Runs a program, its name first, to its end.
 Result Run(const std::vector<std::string>& command);

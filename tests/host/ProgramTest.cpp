@@ -183,7 +183,7 @@ TEST(Program, RefusesAndLeavesEverythingAsItWas) {
     const std::string whole = ReadFile(
         Make("index-first.mp4", Join(CountedPictures(1), Beeps(1), Args{"-movflags", "+faststart"})));
     WriteFile(folder / "head.mp4", whole.substr(0, whole.find("mdat") + 4)); // opens, but holds nothing
-    WriteFile(folder / "index-lost.mp4", whole.substr(whole.find("mdat") - 4));
+    WriteFile(folder / "body.mp4", whole.substr(whole.find("mdat") - 4));
     WriteFile(folder / "empty.mp4", "");
     const std::vector<std::string> before = folder.Names();
     const struct {
@@ -209,7 +209,7 @@ TEST(Program, RefusesAndLeavesEverythingAsItWas) {
         {{folder.Path(), folder / "out.mp4"}, 3, "directory"},
         {{source, folder / "out.xyz"}, 2, "--format"},
         {{source, folder / "out"}, 2, "--format"},
-        {{folder / "index-lost.mp4", folder / "out.mp4"}, 3, "index"},
+        {{folder / "body.mp4", folder / "out.mp4"}, 3, "index"},
         {{folder / "empty.mp4", folder / "out.mp4"}, 3, "empty.mp4"},
         {{source, folder / "out.mp4", "--log", folder / "nowhere/log"}, 4, "nowhere/log"},
         {{folder / "none.mkv", folder / "out.mp4"}, 3, "none.mkv"},

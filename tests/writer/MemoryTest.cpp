@@ -5,13 +5,13 @@
 #include "tests/engine/CountingAllocator.h"
 #include "tests/faults/CrashReport.h"
 #include "tests/support/Folder.h"
+#include "tests/support/Process.h"
 #include "text/Utf8.h"
 #include "writer/WriterStatus.h"
 
 #include <gtest/gtest.h>
 
 #include <algorithm>
-#include <cstdio>
 #include <cstdlib>
 #include <filesystem>
 #include <mutex>
@@ -19,7 +19,6 @@
 #include <tuple>
 #include <vector>
 
-#include <sys/wait.h>
 #include <unistd.h>
 
 namespace {
@@ -163,31 +162,6 @@ int Attempt(const Case& what, int64_t number, const ReadMovie& whole) {
     return failed ? kFailed : kNothingFailed;
 }
 
-struct Ended {
-    int code; ///< Exit code, or 128 plus the signal.
-    std::string text;
-};
-
-/// Lives `life` in a process of its own.
-template <class Life>
-Ended InChild(Life life) {
-    std::FILE* log = std::tmpfile();
-    const pid_t child = fork();
-    if (child == 0) {
-        dup2(fileno(log), STDOUT_FILENO);
-        dup2(fileno(log), STDERR_FILENO);
-        std::exit(life());
-    }
-    int status = 0;
-    waitpid(child, &status, 0);
-    std::rewind(log);
-    std::string text;
-    for (int c = std::fgetc(log); c != EOF; c = std::fgetc(log))
-        text += static_cast<char>(c);
-    std::fclose(log);
-    return {WIFEXITED(status) ? WEXITSTATUS(status) : 128 + WTERMSIG(status), text};
-}
-
 class MemoryTest : public testing::TestWithParam<Case> {};
 
 TEST_P(MemoryTest, ALackOfItIsToldAndLeavesAWholeFileOrNone) {
@@ -197,13 +171,15 @@ TEST_P(MemoryTest, ALackOfItIsToldAndLeavesAWholeFileOrNone) {
     const ReadMovie whole = ReadMovieFile(unharmed.path);
     std::string faults;
     int64_t number = 1;
-    for (Ended ended{kFailed, ""}; ended.code != kNothingFailed && number < kMost; number = After(number)) {
+    for (ProcessResult ended{kFailed, "", ""}; ended.code != kNothingFailed && number < kMost;
+         number = After(number)) {
         ended = InChild([&] {
             setenv("TMPDIR", unharmed.folder.Path().c_str(), 1); // so that a crash leaves nothing behind
             return Attempt(GetParam(), number, whole);
         });
-        if (ended.code != kFailed && ended.code != kNothingFailed && !IsKnownCrash(ended.text))
-            faults += "allocation " + std::to_string(number) + ": " + std::to_string(ended.code) + ended.text;
+        if (ended.code != kFailed && ended.code != kNothingFailed && !IsKnownCrash(ended.err))
+            faults += "allocation " + std::to_string(number) + ": " + std::to_string(ended.code) + ended.out +
+                      ended.err;
     }
     EXPECT_EQ(faults, "");
     EXPECT_LT(number, kMost);

@@ -77,7 +77,6 @@ void Describe(AVFormatContext& input, AVStream& stream, ReadMovie& movie) {
         ++movie.videoStreams;
         movie.videoCodec = parameters.codec_id;
         movie.sampleAspect = av_guess_sample_aspect_ratio(&input, &stream, nullptr);
-        movie.frameRate = stream.avg_frame_rate;
     } else if (parameters.codec_type == AVMEDIA_TYPE_AUDIO) {
         ++movie.audioStreams;
         movie.audioCodec = parameters.codec_id;
@@ -107,7 +106,6 @@ ReadMovie ReadMovieFile(const std::string& path) {
     const av::Input input(context);
     if (avformat_find_stream_info(context, nullptr) < 0)
         return movie;
-    movie.format = context->iformat->name;
     movie.duration = static_cast<double>(context->duration) / AV_TIME_BASE;
     std::map<int, av::CodecContext> decoders;
     for (unsigned i = 0; i < context->nb_streams; ++i) {

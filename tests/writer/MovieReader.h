@@ -24,13 +24,11 @@ struct ReadPicture {
 /// One decoded movie. Streams that are missing leave their fields as they are.
 struct ReadMovie {
     bool readable = false;
-    std::string format;
     double duration = 0; ///< Seconds, as the container says.
 
     int videoStreams = 0;
     AVCodecID videoCodec = AV_CODEC_ID_NONE;
     AVRational sampleAspect{0, 1};
-    AVRational frameRate{0, 1};
     std::vector<ReadPicture> pictures;
 
     int audioStreams = 0;

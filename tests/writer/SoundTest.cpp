@@ -10,24 +10,24 @@
 
 namespace {
 
-/// Frequency by the rising zero crossings, without the first and the last tenth.
-double Frequency(const ReadMovie& movie) {
-    const size_t from = movie.firstChannel.size() / 10;
-    const size_t to = movie.firstChannel.size() - from;
-    int crossings = 0;
-    for (size_t i = from + 1; i < to; ++i)
-        crossings += movie.firstChannel[i - 1] < 0 && movie.firstChannel[i] >= 0 ? 1 : 0;
-    return crossings * static_cast<double>(movie.sampleRate) / static_cast<double>(to - from);
-}
+struct Tone {
+    double frequency; ///< Hz, by the rising zero crossings.
+    double loudness;  ///< Root of the mean square.
+};
 
-/// Root of the mean square without the first and the last tenth.
-double Loudness(const ReadMovie& movie) {
-    const size_t from = movie.firstChannel.size() / 10;
-    const size_t to = movie.firstChannel.size() - from;
-    double sum = 0;
-    for (size_t i = from; i < to; ++i)
-        sum += static_cast<double>(movie.firstChannel[i]) * movie.firstChannel[i];
-    return std::sqrt(sum / static_cast<double>(to - from));
+/// The tone without its first and its last tenth.
+Tone Heard(const ReadMovie& movie) {
+    const std::vector<float>& sound = movie.firstChannel;
+    const size_t from = sound.size() / 10;
+    const size_t to = sound.size() - from;
+    int crossings = 0;
+    double squares = 0;
+    for (size_t i = from + 1; i < to; ++i) {
+        crossings += sound[i - 1] < 0 && sound[i] >= 0 ? 1 : 0;
+        squares += static_cast<double>(sound[i]) * sound[i];
+    }
+    const auto samples = static_cast<double>(to - from);
+    return {crossings * movie.sampleRate / samples, std::sqrt(squares / samples)};
 }
 
 struct Pcm {
@@ -49,8 +49,8 @@ TEST_P(SoundFormats, AreHeardAsTheyWere) {
     EXPECT_TRUE(read.readable);
     EXPECT_GE(read.sampleRate, std::min(GetParam().rate, 96000));
     EXPECT_LE(read.channels, GetParam().channels);
-    EXPECT_NEAR(Frequency(read), 440.0, 3.0);
-    EXPECT_NEAR(Loudness(read), 0.5 / M_SQRT2, 0.03);
+    EXPECT_NEAR(Heard(read).frequency, 440.0, 3.0);
+    EXPECT_NEAR(Heard(read).loudness, 0.5 / M_SQRT2, 0.03);
     EXPECT_NEAR(Latest().dAudioWritten, 2.0, 0.0002);
     EXPECT_LE(static_cast<double>(read.samples), 2.0 * read.sampleRate + 1024);
 }
@@ -113,7 +113,7 @@ TEST(Sound, BlocksThatSplitASampleAreJoined) {
         }
     });
     ASSERT_EQ(read.samples, 10'000);
-    EXPECT_NEAR(Frequency(read), 440.0, 6.0);
+    EXPECT_NEAR(Heard(read).frequency, 440.0, 6.0);
 }
 
 TEST(Sound, LateSoundBeginsLate) {
@@ -129,8 +129,8 @@ TEST(Sound, LateSoundBeginsLate) {
             for (int number = 0; number < 40; ++number)
                 MWWriteVideoFrame(file, &picture.Paint(number, number * 400'000));
         });
-        EXPECT_NEAR(read.ToneBegins(), 0.4, 0.03) << read.format;
-        EXPECT_NEAR(read.pictures.front().time, 0.0, 0.03) << read.format;
+        EXPECT_NEAR(read.ToneBegins(), 0.4, 0.03) << format;
+        EXPECT_NEAR(read.pictures.front().time, 0.0, 0.03) << format;
     }
 }
 

@@ -1,0 +1,51 @@
+// Processes of a test's own.
+#ifndef MOVIECONV_TESTS_SUPPORT_PROCESS_H
+#define MOVIECONV_TESTS_SUPPORT_PROCESS_H
+
+#include <cstdio>
+#include <cstdlib>
+#include <string>
+
+#include <sys/wait.h>
+#include <unistd.h>
+
+/// What a process has left.
+struct ProcessResult {
+    int code; ///< Exit code, or 128 plus the signal that ended it.
+    std::string out;
+    std::string err;
+};
+
+/// Waits for the end of a process; gives its exit code, or 128 plus the signal that ended it.
+inline int AwaitEnd(pid_t child) {
+    int status = 0;
+    waitpid(child, &status, 0);
+    return WIFEXITED(status) ? WEXITSTATUS(status) : 128 + WTERMSIG(status);
+}
+
+/// What has been written into a file, which is closed.
+inline std::string Drain(std::FILE* file) {
+    std::rewind(file);
+    std::string text;
+    for (int c = std::fgetc(file); c != EOF; c = std::fgetc(file))
+        text += static_cast<char>(c);
+    std::fclose(file);
+    return text;
+}
+
+/// Lives `life`, which returns the exit code, in a process of its own.
+template <class Life>
+ProcessResult InChild(Life life) {
+    std::FILE* out = std::tmpfile();
+    std::FILE* err = std::tmpfile();
+    const pid_t child = fork();
+    if (child == 0) {
+        dup2(fileno(out), STDOUT_FILENO);
+        dup2(fileno(err), STDERR_FILENO);
+        std::exit(life());
+    }
+    const int code = AwaitEnd(child);
+    return {code, Drain(out), Drain(err)};
+}
+
+#endif
