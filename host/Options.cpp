@@ -57,23 +57,24 @@ void AddEncoding(CLI::App& app, Options& options) {
 
 void AddPictures(CLI::App& app, Options& options) {
     const std::string group = "Pictures";
-    AddParsed(app, "--size", ParseSize, options.size, "a size such as 640x360",
+    AddParsed(app, "--size", ParseSize, options.size, "a size from 2x2 to 32768x32768, such as 640x360",
               "Picture size; by default the source's")
         ->type_name("WxH")
         ->group(group);
     AddChoice<Fit>(app, "--fit", options.fit, {{"borders", Fit::kBorders}, {"stretch", Fit::kStretch}},
                    "How pictures of another shape fill it: with borders\n(default) or by stretching")
         ->group(group);
-    AddParsed(app, "--frame-rate", ParseFrameRate, options.frameRate, "a frame rate such as 25 or 30000/1001",
+    AddParsed(app, "--frame-rate", ParseFrameRate, options.frameRate,
+              "a frame rate up to 200, such as 25 or 30000/1001",
               "Pictures per second; by default the source's")
         ->type_name("N")
         ->group(group);
-    AddParsed(app, "--video-rate", ParseRate, options.videoRate, "a bit rate such as 512k or 1.5M",
-              "Bits per second, as 1.5M (default 512k)")
+    AddParsed(app, "--video-rate", ParseRate, options.videoRate,
+              "a bit rate up to 2147M, such as 512k or 1.5M", "Bits per second, as 1.5M (default 512k)")
         ->type_name("RATE")
         ->group(group);
-    AddParsed(app, "--video-max-rate", ParseRate, options.videoMaxRate, "a bit rate such as 512k or 1.5M",
-              "Upper bit rate: the rate becomes a target")
+    AddParsed(app, "--video-max-rate", ParseRate, options.videoMaxRate,
+              "a bit rate up to 2147M, such as 512k or 1.5M", "Upper bit rate: the rate becomes a target")
         ->type_name("RATE")
         ->group(group);
 }
@@ -88,12 +89,12 @@ void AddSound(CLI::App& app, Options& options) {
         ->check(CLI::Range(4000, 384000).description(""))
         ->type_name("HZ")
         ->group(group);
-    AddParsed(app, "--audio-rate", ParseRate, options.audioRate, "a bit rate such as 128k",
+    AddParsed(app, "--audio-rate", ParseRate, options.audioRate, "a bit rate up to 2147M, such as 128k",
               "Bits per second (default 128k)")
         ->type_name("RATE")
         ->group(group);
-    AddParsed(app, "--audio-max-rate", ParseRate, options.audioMaxRate, "a bit rate such as 128k",
-              "Upper bit rate: the rate becomes a target")
+    AddParsed(app, "--audio-max-rate", ParseRate, options.audioMaxRate,
+              "a bit rate up to 2147M, such as 128k", "Upper bit rate: the rate becomes a target")
         ->type_name("RATE")
         ->group(group);
 }

@@ -65,7 +65,7 @@ VideoSettings MakeVideoSettings(const EncodeParam& param, const VideoFormat& sou
                             nullptr) < 0)
         throw WriterFailure(kWriterErrorArgument, "Pictures of " + std::to_string(settings.width) + "x" +
                                                       std::to_string(settings.height) +
-                                                      " cannot be written.");
+                                                      " cannot be written; choose another size.");
     settings.rate = ExactRate(
         FirstPositive(UsableRate(param.dFrameRate), UsableRate(source.dFrameRate), kDefaultFrameRate));
     settings.bitrate = FirstPositive(param.nVideoBitrate, kDefaultVideoBitrate, 0);

@@ -225,6 +225,7 @@ TEST(Program, RefusesAndLeavesEverythingAsItWas) {
         {{source, folder / "out.mp4", "--video-codec", "H.264"}, 2, "four characters"},
         {{source, folder / "out.mp4", "--no-video", "--no-audio"}, 2, "--no-audio"},
         {{source, folder / "out.mp3", "--no-audio"}, 2, "MP3"},
+        {{source, folder / "out.mp4", "--frame-rate", "240"}, 2, "up to 200"},
         {{source}, 2, "OUTPUT"},
         {{}, 2, "INPUT"},
         {{"--nonsense"}, 2, "--help"},
