@@ -32,8 +32,7 @@ PictureDecoder::PictureDecoder(const Source& source, Demuxer& demuxer)
              {L"Movie::The picture decoder waits for the conversion",
               L"Movie::The conversion waits for the picture decoder"}) {
     const PictureStreamInfo& pictures = *source.Info().pictures;
-    info_.format = {pictures.width, pictures.height, pictures.frameRate,
-                    source.Info().Announced(pictures.duration)};
+    info_.format = {pictures.width, pictures.height, pictures.frameRate, pictures.duration};
     trial_.emplace();
 }
 

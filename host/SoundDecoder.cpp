@@ -53,8 +53,7 @@ SoundDecoder::SoundDecoder(const Source& source, Demuxer& demuxer)
     frameBytes_ = static_cast<int64_t>(sound.channels) * sound.bitsPerSample / 8;
     blockBytes_ = BlockSamples(source.Info()) * frameBytes_;
     info_.format = {sound.sampleRate, sound.channels, sound.bitsPerSample,
-                    static_cast<int32_t>(sound.sampleRate * frameBytes_),
-                    source.Info().Announced(sound.duration)};
+                    static_cast<int32_t>(sound.sampleRate * frameBytes_), sound.duration};
     CopyLayout(*outputLayout_.Get(), stream_->codecpar->ch_layout);
 }
 

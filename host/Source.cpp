@@ -104,10 +104,6 @@ std::string LayoutName(const AVChannelLayout& layout) {
 
 } // namespace
 
-double SourceInfo::Announced(double seconds) const {
-    return certainty == Certainty::kKnown ? seconds : std::max(2 * seconds, kGuessedDuration);
-}
-
 Source::Source(const std::string& path, SourceChoice choice) : choice_(choice) {
     info_.path = path;
     Open();

@@ -61,10 +61,6 @@ struct SourceInfo {
     Certainty certainty = Certainty::kKnown; ///< Of `duration`.
     std::optional<PictureStreamInfo> pictures;
     std::optional<SoundStreamInfo> sound;
-
-    /// What to announce of a stream of `seconds` to the engine, which converts no sound beyond: more than
-    /// enough where nobody knows.
-    double Announced(double seconds) const;
 };
 
 struct SourceChoice {

@@ -363,7 +363,6 @@ TEST(Decoders, EstimateTheLengthOfAStreamThatTellsNone) {
     for (const double begin : {0.0, 20.5}) { // longer than what is read to find its length
         Movie sound(Make("long.ac3", Join(Beeps(30), Args{"-c:a", "ac3", "-b:a", "640k"})), {});
         EXPECT_NEAR(sound.Info().duration, 30, 0.1);
-        EXPECT_GT(sound.Sound()->GetAudioInfo()->format.dDuration, 31); // beyond, all would be lost
         EXPECT_EQ(Beginnings(TakeAll(sound, begin), 44100).size(), begin > 0 ? 9u : 30u);
     }
 }
