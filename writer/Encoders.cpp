@@ -79,7 +79,8 @@ void SetPreset(AVCodecContext& context, AVRational rate) {
         context.gop_size = keyDistance;
     } else if (std::strcmp(encoder, "libx265") == 0) {
         set("preset", "fast");
-        set("x265-params", "log-level=none");
+        // Frames encoded side by side can wait for each other for ever at the end; rows still are.
+        set("x265-params", "log-level=none:frame-threads=1");
         context.gop_size = keyDistance;
     } else if (std::strncmp(encoder, "libvpx", 6) == 0) {
         set("deadline", "good");
