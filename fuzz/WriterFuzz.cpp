@@ -161,7 +161,7 @@ public:
 
     const AudioFrame& Next() {
         frame = {};
-        frame.nType = input.ConsumeIntegralInRange(0, 7) == 0 ? kMediaTypeSilence : 2;
+        frame.nType = input.ConsumeIntegralInRange(0, 7) == 0 ? kMediaTypeSilence : kMediaTypeSound;
         frame.nSampleRate = WildInteger(input, 8000);
         if (frame.nSampleRate > 0 && frame.nSampleRate < 1000)
             frame.nSampleRate = 1000; // hours of sound in a few bytes would only take long

@@ -9,7 +9,6 @@ namespace {
 
 constexpr int kBlocksPerSecond = 100;
 constexpr int kSmallestBlock = 16; // samples
-constexpr int32_t kMediaTypeSound = 2;
 
 /// Samples in one block: 10 ms, and always less than half a picture, so that pictures and sound interleave
 /// finely.

@@ -43,6 +43,7 @@ typedef struct AudioSourceInfo {
 
 enum {
     kMediaTypePicture = 1,      ///< VideoImage::nType of a picture.
+    kMediaTypeSound = 2,        ///< AudioFrame::nType of sound.
     kMediaTypeSilence = 3,      ///< AudioFrame::nType of the silence that the engine makes itself.
     kPictureFormatPlanar420 = 2 ///< VideoImage::nFormat of planar YUV 4:2:0.
 };
@@ -68,7 +69,7 @@ typedef struct VideoImage {
 
 /// One block of interleaved PCM sound: 76 bytes in the 32-bit build, 80 in the 64-bit one.
 typedef struct AudioFrame {
-    int32_t nType;              ///< Kind code; kMediaTypeSilence in the engine's own blocks.
+    int32_t nType;              ///< kMediaTypeSound; kMediaTypeSilence in the engine's own blocks.
     int32_t nSampleRate;        ///< Samples per second and channel.
     int32_t nChannels;          ///< Channel count.
     int32_t nBitsPerSample;     ///< Bits per sample.
