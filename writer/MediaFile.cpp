@@ -203,9 +203,9 @@ void MediaFile::StartSoundIfKnown() {
 }
 
 bool MediaFile::PushSound() {
-    const std::vector<SoundBlock> blocks = std::exchange(waiting_, {});
+    std::vector<SoundBlock> blocks = std::exchange(waiting_, {});
     return std::all_of(blocks.begin(), blocks.end(),
-                       [this](const SoundBlock& block) { return sound_->Push(block); });
+                       [this](SoundBlock& block) { return sound_->Push(std::move(block)); });
 }
 
 void MediaFile::Write(AVPacket& packet, int stream) {

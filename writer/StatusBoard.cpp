@@ -14,15 +14,10 @@ namespace {
 
 constexpr size_t kRemembered = 64;
 
-bool IsOpen(const FileRecord& record) {
-    const int state = record.Snapshot().nState;
-    return state == kWriterFileWriting || state == kWriterFileFinishing;
-}
-
 } // namespace
 
 FileRecord::FileRecord(int sequence, std::string_view path, const WriterOptions& options)
-    : options_(options) {
+    : sequence_(sequence), options_(options) {
     status_.nSequence = sequence;
     status_.nState = kWriterFileWriting;
     CopyText(status_.szPath, sizeof status_.szPath, path);
@@ -31,6 +26,11 @@ FileRecord::FileRecord(int sequence, std::string_view path, const WriterOptions&
 WriterStatus FileRecord::Snapshot() const {
     const std::lock_guard lock(mutex_);
     return status_;
+}
+
+bool FileRecord::IsOpen() const {
+    const std::lock_guard lock(mutex_);
+    return status_.nState == kWriterFileWriting || status_.nState == kWriterFileFinishing;
 }
 
 bool FileRecord::Fail(const WriterFailure& failure) noexcept {
@@ -102,7 +102,7 @@ int StatusBoard::Count() const {
 std::shared_ptr<const FileRecord> StatusBoard::Find(int sequence) const {
     const std::lock_guard lock(mutex_);
     const auto found = std::find_if(records_.begin(), records_.end(), [sequence](const auto& record) {
-        return record->Snapshot().nSequence == sequence;
+        return record->Sequence() == sequence;
     });
     return found == records_.end() ? nullptr : *found;
 }
@@ -115,10 +115,10 @@ std::shared_ptr<const FileRecord> StatusBoard::LastFailure() const {
 }
 
 void StatusBoard::ForgetOld() {
-    auto closed = static_cast<size_t>(
-        std::count_if(records_.begin(), records_.end(), [](const auto& record) { return !IsOpen(*record); }));
+    auto closed = static_cast<size_t>(std::count_if(records_.begin(), records_.end(),
+                                                    [](const auto& record) { return !record->IsOpen(); }));
     for (auto record = records_.begin(); closed > kRemembered && record != records_.end();) {
-        if (IsOpen(**record)) {
+        if ((*record)->IsOpen()) {
             ++record;
         } else {
             record = records_.erase(record);

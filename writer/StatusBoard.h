@@ -18,8 +18,10 @@ public:
     FileRecord(int sequence, std::string_view path, const WriterOptions& options);
 
     const WriterOptions& Options() const { return options_; }
+    int Sequence() const { return sequence_; }
 
     WriterStatus Snapshot() const;
+    bool IsOpen() const;
 
     /// Changes the status under its lock.
     template <typename Change>
@@ -41,6 +43,7 @@ public:
     bool AskAboutFullDisk() const;
 
 private:
+    const int sequence_;
     const WriterOptions options_;
     mutable std::mutex mutex_;
     WriterStatus status_{};
