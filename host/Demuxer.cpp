@@ -49,6 +49,8 @@ bool Demuxer::Seek(double seconds) {
         return soughtWell_ && seconds == soughtSeconds_;
     soughtSeconds_ = seconds;
     soughtWell_ = source_.IsSeekable() && (SeekBefore(seconds) || source_.Rewind());
+    if (!soughtWell_ && moved_)
+        readError_ = "it cannot be read from its start again";
     return soughtWell_;
 }
 
@@ -63,6 +65,7 @@ bool Demuxer::SeekBefore(double seconds) {
         const auto seek = [&] { return avformat_seek_file(context, -1, INT64_MIN, target, target, 0) >= 0; };
         if (!seek())
             return false;
+        moved_ = true;
         if (KeyPictureAtOrBefore(ToMediaTime(seconds)))
             return seek();
         back = 2 * back + 1;

@@ -75,6 +75,7 @@ private:
     Source& source_;
     double soughtSeconds_ = -1;
     bool soughtWell_ = false;
+    bool moved_ = false; // away from the start
 
     mutable std::mutex mutex_;
     std::condition_variable changed_;

@@ -12,51 +12,39 @@ constexpr OSType Code(const char (&text)[5]) {
 
 constexpr OSType kHostClass = Code("mcvh");
 constexpr OSType kEngineClass = 5000;
-constexpr EventParamName kValueName = Code("valu");
-constexpr EventParamType kValueType = Code("UINT");
 constexpr EventParamName kEngineKind = Code("WPAM");
-constexpr EventParamName kEngineValue = Code("LPAM");
 
-uint32_t Parameter(EventRef event, EventParamName name) {
-    uint32_t value = 0;
-    GetEventParameter(event, name, kValueType, nullptr, sizeof value, nullptr, &value);
-    return value;
-}
-
-/// Fills in `out`; false for events that nobody waits for. The engine's finished event is one of them: it is
-/// missing when there was nothing to convert, so the program goes by the callback.
-bool Translate(EventRef event, Event& out) {
-    if (GetEventClass(event) == kHostClass) {
-        out = {static_cast<EventKind>(GetEventKind(event)), Parameter(event, kValueName)};
-        return true;
-    }
-    if (GetEventClass(event) == kEngineClass && Parameter(event, kEngineKind) == 0) {
-        out = {EventKind::kProgress, Parameter(event, kEngineValue)};
-        return true;
-    }
-    return false;
+/// Nothing for events that nobody waits for. The engine's finished event is one of them: it is missing when
+/// there was nothing to convert, so the program goes by the callback.
+std::optional<EventKind> KindOf(EventRef event) {
+    if (GetEventClass(event) == kHostClass)
+        return static_cast<EventKind>(GetEventKind(event));
+    uint32_t engineKind = 0;
+    GetEventParameter(event, kEngineKind, Code("UINT"), nullptr, sizeof engineKind, nullptr, &engineKind);
+    if (GetEventClass(event) == kEngineClass && engineKind == 0)
+        return EventKind::kProgress;
+    return std::nullopt;
 }
 
 } // namespace
 
-void PostHostEvent(EventKind kind, uint32_t value) {
+void PostHostEvent(EventKind kind) {
     EventRef event = nullptr;
     if (CreateEvent(nullptr, kHostClass, static_cast<UInt32>(kind), 0, 0, &event) == noErr) {
-        SetEventParameter(event, kValueName, kValueType, sizeof value, &value);
         PostEventToQueue(GetMainEventQueue(), event, kEventPriorityStandard);
         ReleaseEvent(event);
     }
 }
 
-bool ReceiveHostEvent(double seconds, Event& event) {
-    EventRef received = nullptr;
-    while (ReceiveNextEvent(0, nullptr, seconds, 1, &received) == noErr) {
-        const bool known = Translate(received, event);
-        ReleaseEvent(received);
-        if (known)
-            return true;
+std::optional<EventKind> ReceiveHostEvent(double seconds) {
+    EventRef event = nullptr;
+    while (ReceiveNextEvent(0, nullptr, seconds, 1, &event) == noErr) {
+        const std::optional<EventKind> kind = KindOf(event);
+        ReleaseEvent(event);
+        if (kind)
+            return kind;
     }
-    return false;
+    return std::nullopt;
 }
 
 } // namespace host

@@ -3,6 +3,7 @@
 #include "host/MediaTime.h"
 
 #include <algorithm>
+#include <utility>
 
 namespace host {
 namespace {
@@ -88,7 +89,6 @@ bool PictureDecoder::Advance() {
     image_.nPitchV = frame.linesize[2];
     image_.llTime = image_.llTime2 = current_.stamp.time;
     image_.nDuration = static_cast<int32_t>(std::min<int64_t>(current_.stamp.duration, INT32_MAX));
-    ++delivered_;
     return true;
 }
 
@@ -109,7 +109,8 @@ void PictureDecoder::DecodeAll() {
         if (!decoder_->Decode(packet.get(), accept))
             return;
         damaged_ = damagedBefore_ + decoder_->Damaged();
-        ConsiderMoreThreads(av::Packet(trial_ ? av_packet_clone(packet.get()) : nullptr));
+        if (!ConsiderMoreThreads(av::Packet(trial_ ? av_packet_clone(packet.get()) : nullptr)))
+            return;
     }
     decoder_->Decode(nullptr, accept);
 }
@@ -160,33 +161,33 @@ bool PictureDecoder::Deliver(StampRepair::Stamp stamp) {
 
 /// One thread decodes at first, which costs the least and is enough for most movies: the encoder is slower.
 /// When the queue keeps running empty, the decoder is the slower one and gets the other processors too, if
-/// the program leaves them idle.
-void PictureDecoder::ConsiderMoreThreads(av::Packet packet) {
+/// the program leaves them idle. False when nobody takes pictures any more.
+bool PictureDecoder::ConsiderMoreThreads(av::Packet packet) {
     if (!trial_)
-        return;
+        return true;
     if (!packet) { // no memory for its copy: the decoder stays as it is
         trial_.reset();
-        return;
+        return true;
     }
     trial_->push_back(std::move(packet));
     const int judged = pushed_ - kWarmUpPictures;
     if (judged < kTrialPictures && trial_->size() < kTrialPackets)
-        return;
+        return true;
+    const std::vector<av::Packet> known = *std::exchange(trial_, std::nullopt);
     const bool runsEmpty = judged <= 0 || starved_ * 2 > judged;
-    if (runsEmpty && use_.Processors() < kBusy * std::thread::hardware_concurrency())
-        UseMoreThreads();
-    trial_.reset();
+    const bool leavesIdle = use_.Processors() < kBusy * std::thread::hardware_concurrency();
+    return !runsEmpty || !leavesIdle || UseMoreThreads(known);
 }
 
 /// Begins again with more threads and skips the frames that are known, whatever lies between key pictures.
-void PictureDecoder::UseMoreThreads() {
-    threads_ = static_cast<int>(std::min(std::thread::hardware_concurrency(), kMostThreads));
+bool PictureDecoder::UseMoreThreads(const std::vector<av::Packet>& known) {
+    const unsigned threads = std::min(std::thread::hardware_concurrency(), kMostThreads);
     damagedBefore_ += decoder_->Damaged();
-    decoder_ = std::make_unique<StreamDecoder>(*stream_, threads_);
+    decoder_ = std::make_unique<StreamDecoder>(*stream_, static_cast<int>(threads));
     skip_ = decoded_;
-    for (const av::Packet& packet : *trial_)
-        if (!decoder_->Decode(packet.get(), [this](AVFrame& frame) { return Accept(frame); }))
-            return;
+    return std::all_of(known.begin(), known.end(), [this](const av::Packet& packet) {
+        return decoder_->Decode(packet.get(), [this](AVFrame& frame) { return Accept(frame); });
+    });
 }
 
 } // namespace host

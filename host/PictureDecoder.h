@@ -43,11 +43,9 @@ public:
     /// Figures for the closing report. Any thread.
     int64_t Damaged() const { return damaged_; }
     int64_t Repaired() const { return repaired_; }
-    int64_t Delivered() const { return delivered_; }
 
     /// The picture handed out last, null without one. Once the conversion has ended.
     const VideoImage* Last() const { return current_.frame ? &image_ : nullptr; }
-    int Threads() const { return threads_; }
 
 private:
     struct Picture {
@@ -59,8 +57,8 @@ private:
     void DecodeAll();
     bool Accept(AVFrame& frame);
     bool Deliver(StampRepair::Stamp stamp);
-    void ConsiderMoreThreads(av::Packet packet);
-    void UseMoreThreads();
+    bool ConsiderMoreThreads(av::Packet packet);
+    bool UseMoreThreads(const std::vector<av::Packet>& known);
     bool Advance();
 
     const Source& source_;
@@ -89,8 +87,6 @@ private:
     BoundedQueue<Picture> queue_;
     std::atomic<int64_t> damaged_{0};
     std::atomic<int64_t> repaired_{0};
-    std::atomic<int64_t> delivered_{0};
-    std::atomic<int> threads_{1};
     std::thread thread_;
 
     // The engine worker's.

@@ -410,7 +410,9 @@ const AVStream* Source::SoundStream() const {
 }
 
 int64_t Source::MediaTime(int64_t stamp, const AVStream* stream) const {
-    return av_rescale_q(stamp, stream->time_base, {1, kMediaSecond}) - start_;
+    constexpr int64_t kFarthest = int64_t{1} << 60; // room for sums with what damaged stamps tell
+    return std::clamp(av_rescale_q(stamp, stream->time_base, {1, kMediaSecond}), -kFarthest, kFarthest) -
+           start_;
 }
 
 } // namespace host
