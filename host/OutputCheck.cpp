@@ -14,6 +14,7 @@
 #include <sys/stat.h>
 #include <sys/statvfs.h>
 #include <unistd.h>
+#include <utility>
 
 namespace host {
 namespace {
@@ -32,8 +33,14 @@ bool SameFile(const struct stat& a, const struct stat& b) {
 /// Refuses a file that the conversion would replace.
 void CheckTarget(const std::string& path, const struct stat* input, const Options& options) {
     struct stat target {};
-    if (stat(path.c_str(), &target) != 0)
+    if (stat(path.c_str(), &target) != 0) {
+        if (lstat(path.c_str(), &target) == 0) {
+            throw Failure(
+                ExitCode::kCannotWrite,
+                fmt::format("\"{}\" is a link to a missing file; name that file, or remove the link", path));
+        }
         return;
+    }
     if (input != nullptr && SameFile(*input, target)) {
         throw Failure(ExitCode::kUsage,
                       fmt::format("\"{}\" is the source itself; give the output another name", path));
@@ -65,6 +72,12 @@ void CheckFolder(const std::string& folder) {
     }
 }
 
+/// The name up to its last dot, and the rest.
+std::pair<std::string_view, std::string_view> SplitName(std::string_view name) {
+    const std::size_t dot = std::min(name.rfind('.'), name.size());
+    return {name.substr(0, dot), name.substr(dot)};
+}
+
 /// Whether `name` is a clip name made of `base` and `extension`: base_00.ext and so on.
 bool IsClipName(std::string_view name, std::string_view base, std::string_view extension) {
     const std::size_t frame = base.size() + 1 + extension.size();
@@ -77,14 +90,12 @@ bool IsClipName(std::string_view name, std::string_view base, std::string_view e
 
 void CheckClips(const Options& options, const struct stat* input) {
     const std::string name = NameOf(options.output);
-    const std::size_t dot = name.rfind('.');
-    if (dot == std::string::npos || dot == 0) {
+    const auto [base, extension] = SplitName(name);
+    if (base.empty() || extension.empty()) {
         throw Failure(
             ExitCode::kUsage,
             fmt::format("with --split the output needs an extension, as in \"{}.mp4\"", options.output));
     }
-    const std::string base = name.substr(0, dot);
-    const std::string extension = name.substr(dot);
     const std::size_t pathCharacters = text::FromUtf8(options.output).size();
     constexpr std::size_t kNameBytes = 255;
     if (pathCharacters + kClipNumberRoom > MC_MAX_TARGET_NAME || extension.size() > kLongestClipExtension ||
@@ -98,6 +109,38 @@ void CheckClips(const Options& options, const struct stat* input) {
     while (const dirent* entry = listing ? readdir(listing.get()) : nullptr)
         if (IsClipName(entry->d_name, base, extension))
             CheckTarget(folder + "/" + entry->d_name, input, options);
+}
+
+bool AreSame(const std::string& path, const std::string& other) {
+    struct stat a {};
+    struct stat b {};
+    return stat(path.c_str(), &a) == 0 && stat(other.c_str(), &b) == 0 && SameFile(a, b);
+}
+
+/// Whether a file of that name is or becomes the output, a clip of it, or what they are called until they are
+/// complete.
+bool IsOutput(const std::string& path, const Options& options) {
+    if (AreSame(path, options.output))
+        return true;
+    if (!AreSame(FolderOf(path), FolderOf(options.output)))
+        return false;
+    std::string name = NameOf(path);
+    for (const std::string_view suffix : {".joined.part", ".part"})
+        if (name.size() > suffix.size() && name.ends_with(suffix))
+            name.resize(name.size() - suffix.size());
+    const std::string output = NameOf(options.output);
+    const auto [base, extension] = SplitName(output);
+    return name == output || (options.split && IsClipName(name, base, extension));
+}
+
+void CheckSideFile(const char* option, const std::string& path, const Options& options) {
+    const char* other = AreSame(path, options.input)                         ? "the source"
+                        : !options.output.empty() && IsOutput(path, options) ? "the output or a part of it"
+                                                                             : nullptr;
+    if (other != nullptr) {
+        throw Failure(ExitCode::kUsage,
+                      fmt::format("{} \"{}\" is {}; give it another name", option, path, other));
+    }
 }
 
 } // namespace
@@ -124,6 +167,16 @@ void CheckOutput(const Options& options) {
         CheckClips(options, input);
     else
         CheckTarget(options.output, input, options);
+}
+
+void CheckSideFiles(const Options& options) {
+    if (options.log)
+        CheckSideFile("--log", *options.log, options);
+    if (options.preview)
+        CheckSideFile("--preview", *options.preview, options);
+    if (options.log && options.preview &&
+        (*options.log == *options.preview || AreSame(*options.log, *options.preview)))
+        throw Failure(ExitCode::kUsage, "--log and --preview name the same file");
 }
 
 } // namespace host

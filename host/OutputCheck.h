@@ -13,6 +13,10 @@ namespace host {
 /// leave, cannot be written where it is to go, or has a name of which no clip names can be made.
 void CheckOutput(const Options& options);
 
+/// Throws Failure when the log or the preview would be written over the source, the output, a clip of it or
+/// its temporary file, or over each other.
+void CheckSideFiles(const Options& options);
+
 /// The folder of a path, "." for a plain name.
 std::string FolderOf(const std::string& path);
 

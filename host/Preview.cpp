@@ -67,19 +67,35 @@ av::Packet EncodePng(const AVFrame& frame) {
     return encoded ? std::move(packet) : nullptr;
 }
 
+/// A new file beside `path`, whose name goes to `temporary`. Null with errno set.
+std::FILE* CreateBeside(const std::string& path, std::string& temporary) {
+    constexpr int kMostNumbers = 1000;
+    std::FILE* file = nullptr;
+    for (int number = 1; number <= kMostNumbers && file == nullptr; ++number) {
+        temporary = path + ".part" + (number == 1 ? "" : std::to_string(number));
+        file = std::fopen(temporary.c_str(), "wbxe");
+        if (file == nullptr && errno != EEXIST)
+            break;
+    }
+    return file;
+}
+
 /// Empty on success, else what went wrong.
 std::string ReplaceFile(const std::string& path, const AVPacket& content) {
-    const std::string temporary = path + ".part";
-    std::FILE* file = std::fopen(temporary.c_str(), "wbe");
+    std::string temporary;
+    std::FILE* file = CreateBeside(path, temporary);
     if (file == nullptr)
         return std::strerror(errno);
     const auto size = static_cast<std::size_t>(content.size);
-    const bool written = std::fwrite(content.data, 1, size, file) == size;
-    const bool closed = std::fclose(file) == 0;
-    if (written && closed && std::rename(temporary.c_str(), path.c_str()) == 0)
-        return {};
-    std::string reason = std::strerror(errno);
-    std::remove(temporary.c_str());
+    std::string reason;
+    if (std::fwrite(content.data, 1, size, file) != size)
+        reason = std::strerror(errno);
+    if (std::fclose(file) != 0 && reason.empty())
+        reason = std::strerror(errno);
+    if (reason.empty() && std::rename(temporary.c_str(), path.c_str()) != 0)
+        reason = std::strerror(errno);
+    if (!reason.empty())
+        std::remove(temporary.c_str());
     return reason;
 }
 

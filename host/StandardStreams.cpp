@@ -65,13 +65,14 @@ int StandardStreams::Columns() const {
     return ioctl(output_, TIOCGWINSZ, &size) == 0 && size.ws_col > 0 ? size.ws_col : kUsual;
 }
 
-void StandardStreams::Write(int descriptor, std::string_view text) {
+bool StandardStreams::Write(int descriptor, std::string_view text) {
     while (!text.empty()) {
         const ssize_t count = write(descriptor, text.data(), text.size());
         if (count < 0 && errno != EINTR)
-            return;
+            return errno == EPIPE;
         text.remove_prefix(count > 0 ? static_cast<std::size_t>(count) : 0);
     }
+    return true;
 }
 
 } // namespace host

@@ -17,8 +17,9 @@ public:
     StandardStreams(const StandardStreams&) = delete;
     StandardStreams& operator=(const StandardStreams&) = delete;
 
-    /// Writes to the real standard output at once. What a reader that is gone does not take is dropped.
-    void Print(std::string_view text) const { Write(output_, text); }
+    /// Writes to the real standard output at once. What a reader that is gone does not take is dropped;
+    /// false, with errno set, when the text is lost for another reason.
+    bool Print(std::string_view text) const { return Write(output_, text); }
 
     /// Writes to standard error.
     void PrintError(std::string_view text) const;
@@ -29,7 +30,7 @@ public:
     int Columns() const;
 
 private:
-    static void Write(int descriptor, std::string_view text);
+    static bool Write(int descriptor, std::string_view text);
 
     int output_;
 };

@@ -8,11 +8,16 @@
 #include "host/StandardStreams.h"
 #include "host/Units.h"
 
+#include <cerrno>
 #include <cstdio>
+#include <cstring>
 #include <exception>
+#include <fcntl.h>
 #include <fmt/format.h>
 #include <malloc.h>
 #include <new>
+#include <string>
+#include <unistd.h>
 
 namespace host {
 namespace {
@@ -23,7 +28,27 @@ void LimitHeap() {
     mallopt(M_MMAP_THRESHOLD, 64 * 1024);
 }
 
+/// Descriptors that the caller closed would be given to files and be written to as standard streams.
+void OpenStandardDescriptors() {
+    int descriptor = open("/dev/null", O_RDWR);
+    while (descriptor >= 0 && descriptor <= STDERR_FILENO)
+        descriptor = open("/dev/null", O_RDWR);
+    close(descriptor);
+}
+
+/// For what was asked for as a text.
+void PrintWhole(const StandardStreams& streams, const std::string& text) {
+    if (!streams.Print(text)) {
+        throw Failure(ExitCode::kCannotWrite,
+                      fmt::format("cannot write to the standard output: {}", std::strerror(errno)));
+    }
+}
+
 ExitCode Estimate(const Options& options, Movie& movie, const StandardStreams& streams) {
+    if (movie.Info().certainty == Certainty::kGuessed && !options.length) {
+        throw Failure(ExitCode::kUsage,
+                      fmt::format("\"{}\" does not tell how long it is; use --length", options.input));
+    }
     const double length = LengthToConvert(options, movie.Info());
     const Converter converter = MakeConverter(options, movie);
     EncodeParam param{};
@@ -31,24 +56,24 @@ ExitCode Estimate(const Options& options, Movie& movie, const StandardStreams& s
     const int64_t needed = MCGetEstimateDiskSpaceEx(&param, length);
     const std::string folder = FolderOf(options.output);
     const int64_t free = FreeBytes(folder);
-    streams.Print(
-        fmt::format("needs about {} for {} of output\n", FormatBytes(needed), FormatTime(length, true)));
+    PrintWhole(streams, fmt::format("needs about {} for {} of output\n", FormatBytes(needed),
+                                    FormatTime(length, true)));
     if (free < 0) {
         throw Failure(ExitCode::kCannotWrite,
                       fmt::format("the output's folder \"{}\" cannot be used", folder));
     }
-    streams.Print(fmt::format("{} are free in \"{}\"\n", FormatBytes(free), folder));
+    PrintWhole(streams, fmt::format("{} are free in \"{}\"\n", FormatBytes(free), folder));
     return needed <= free ? ExitCode::kDone : ExitCode::kNoSpace;
 }
 
 ExitCode Perform(const Options& options, const StandardStreams& streams, ControlInput& control) {
     const SourceChoice choice{.pictures = !options.noVideo, .sound = !options.noAudio};
     if (options.task == Task::kListFormats) {
-        streams.Print(ListFormats());
+        PrintWhole(streams, ListFormats());
         return ExitCode::kDone;
     }
     if (options.task == Task::kInfo) {
-        streams.Print(Describe(Source(options.input, choice).Info()));
+        PrintWhole(streams, Describe(Source(options.input, choice).Info()));
         return ExitCode::kDone;
     }
     ChooseFormat(options);
@@ -65,6 +90,7 @@ int Main(int argc, char** argv) {
     const std::optional<Options> options = ParseOptions(argc, argv);
     if (!options)
         return static_cast<int>(ExitCode::kDone);
+    CheckSideFiles(*options);
     ControlInput control;
     const StandardStreams streams(options->log);
     try {
@@ -79,6 +105,7 @@ int Main(int argc, char** argv) {
 
 int main(int argc, char** argv) {
     host::LimitHeap();
+    host::OpenStandardDescriptors();
     try {
         return host::Main(argc, argv);
     } catch (const host::Failure& failure) {

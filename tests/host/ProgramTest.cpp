@@ -175,6 +175,7 @@ TEST(Program, RefusesAndLeavesEverythingAsItWas) {
     const std::string source = folder / "in.mkv";
     fs::copy_file(Counted(), source);
     fs::create_hard_link(source, folder / "same.mkv");
+    fs::create_symlink("nothing.mkv", folder / "link.mkv");
     WriteFile(folder / "there.mp4", "precious");
     WriteFile(folder / "clip_03.mp4", "precious");
     WriteFile(folder / "text.srt", "1\n00:00:00,000 --> 00:00:01,000\nWords alone.\n");
@@ -193,6 +194,10 @@ TEST(Program, RefusesAndLeavesEverythingAsItWas) {
     } refusals[] = {
         {{source, source, "-y"}, 2, "source itself"},
         {{source, folder / "same.mkv", "-y"}, 2, "source itself"},
+        {{source, folder / "out.mkv", "--preview", folder / "same.mkv"}, 2, "is the source"},
+        {{source, folder / "out.mkv", "--log", folder / "out.mkv.part"}, 2, "is the output"},
+        {{source, folder / "clip.mkv", "--split", "1", "--log", folder / "clip_100.mkv"}, 2, "is the output"},
+        {{source, folder / "link.mkv", "-y"}, 4, "a link to a missing file"},
         {{source, folder / "there.mp4"}, 4, "--overwrite"},
         {{source, folder / "clip.mp4", "--split", "1"}, 4, "clip_03.mp4"},
         {{source, folder / "clip", "--split", "1", "-f", "mp4"}, 2, "extension"},
@@ -200,6 +205,7 @@ TEST(Program, RefusesAndLeavesEverythingAsItWas) {
         {{source, folder / "out.mp3", "--split", "1"}, 2, "needs pictures"},
         {{source, folder / "out.mp4", "--split", "0.01"}, 2, "--split takes"},
         {{source, folder / "out.mp4", "--length", "0"}, 2, "at least 0.001"},
+        {{source, folder / "out.mp4", "--length", "9999999999"}, 2, "is not a time"},
         {{source, folder / "there.mp4/out.mp4"}, 4, "is not a folder"},
         {{"--estimate", source, folder / "nowhere/out.mp4"}, 4, "nowhere"},
         {{source, folder / "nowhere/out.mp4"}, 4, "nowhere"},
