@@ -15,6 +15,7 @@
 #include <string>
 #include <sys/eventfd.h>
 #include <sys/signalfd.h>
+#include <system_error>
 #include <termios.h>
 #include <unistd.h>
 
@@ -59,10 +60,12 @@ void WriteAll(int descriptor, const std::string& text) {
 ControlInput::ControlInput() {
     const sigset_t ours = OurSignals();
     pthread_sigmask(SIG_BLOCK, &ours, nullptr);
-    for (const int failure : {SIGPIPE, SIGXFSZ}) // the write that fails tells it
+    for (const int failure : {SIGPIPE, SIGXFSZ, SIGTTIN}) // the write or read that fails tells it
         std::signal(failure, SIG_IGN);
     signals_ = signalfd(-1, &ours, SFD_CLOEXEC);
     wake_ = eventfd(0, EFD_CLOEXEC);
+    if (signals_ < 0 || wake_ < 0)
+        throw std::system_error(errno, std::generic_category(), "no signals can be received");
     thread_ = std::thread(&ControlInput::Run, this);
 }
 
@@ -76,8 +79,15 @@ ControlInput::~ControlInput() {
 }
 
 void ControlInput::Arm(bool keys) {
+    wantsKeys_ = keys;
+    FollowTerminal();
     armed_ = true;
-    if (keys && OwnsTerminal()) {
+}
+
+void ControlInput::FollowTerminal() {
+    if (!wantsKeys_ || !OwnsTerminal()) {
+        keys_ = false;
+    } else if (!keys_) {
         UseKeyboard();
         keys_ = true;
         eventfd_write(wake_, 1);
@@ -86,9 +96,9 @@ void ControlInput::Arm(bool keys) {
 
 void ControlInput::Suspend() {
     RestoreTerminal();
+    keys_ = false;
     kill(getpid(), SIGSTOP);
-    if (keys_ && OwnsTerminal())
-        UseKeyboard();
+    FollowTerminal();
 }
 
 void ControlInput::Run() {
@@ -115,13 +125,15 @@ void ControlInput::TakeSignal() {
     if (read(signals_, &info, sizeof info) != sizeof info)
         return;
     const int signal = static_cast<int>(info.ssi_signo);
-    if (signal == SIGTSTP) {
+    if (signal == SIGTSTP && !armed_) {
+        Suspend();
+    } else if (signal == SIGTSTP) {
         PostHostEvent(EventKind::kSuspend);
     } else if (!armed_ || stopAsked_) {
         LeaveAtOnce(signal);
     } else {
         stopAsked_ = true;
-        PostHostEvent(EventKind::kStop, static_cast<uint32_t>(signal));
+        PostHostEvent(EventKind::kStop);
     }
 }
 
@@ -129,7 +141,7 @@ void ControlInput::TakeKeys() {
     std::array<char, 64> keys{};
     const ssize_t count = read(STDIN_FILENO, keys.data(), keys.size());
     if (count <= 0) {
-        keys_ = false; // the terminal is gone
+        keys_ = false; // the terminal is gone, or another job's
         return;
     }
     for (ssize_t i = 0; i < count; ++i) {
@@ -137,7 +149,7 @@ void ControlInput::TakeKeys() {
         if (key == ' ' || key == 'p' || key == 'P')
             PostHostEvent(EventKind::kPauseKey);
         else if (key == 'q' || key == 'Q')
-            PostHostEvent(EventKind::kStop, 0);
+            PostHostEvent(EventKind::kStop);
     }
 }
 

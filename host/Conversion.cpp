@@ -67,9 +67,10 @@ Conversion::Conversion(const Options& options, Movie& movie, Reporter& reporter,
 }
 
 ExitCode Conversion::Run() {
-    WarnOfSmallRoom();
-    reporter_.Start(
-        {options_.input, options_.output, length_, movie_.Info().certainty != Certainty::kGuessed});
+    const bool lengthKnown = movie_.Info().certainty != Certainty::kGuessed;
+    reporter_.Start({options_.input, options_.output, length_, lengthKnown});
+    if (lengthKnown || options_.length)
+        WarnOfSmallRoom();
     control_.Arm(options_.progress == ProgressStyle::kBar && !options_.quiet);
     clock_.Skip(Now());
     if (MCStart(converter_.get(), options_.begin, options_.length.value_or(0), nullptr, OnProgress, this) !=
@@ -115,11 +116,11 @@ unsigned Conversion::OnProgress(void* context, unsigned kind, unsigned value, ui
 
 void Conversion::WaitForEnd() {
     while (outcome_ == kNone) {
-        Event event{};
-        const bool received = ReceiveHostEvent(paused_ ? -1 : kTickSeconds, event);
+        const std::optional<EventKind> event = ReceiveHostEvent(paused_ ? -1 : kTickSeconds);
         UpdateClock();
-        if (received)
-            Handle(event);
+        control_.FollowTerminal();
+        if (event)
+            Handle(*event);
         if (outcome_ == kNone && WriterWatch::FileVanished())
             Stop(); // whatever else were converted would be lost
         if (outcome_ == kNone)
@@ -137,8 +138,8 @@ void Conversion::UpdateClock() {
         clock_.Go(now);
 }
 
-void Conversion::Handle(const Event& event) {
-    switch (event.kind) {
+void Conversion::Handle(EventKind event) {
+    switch (event) {
     case EventKind::kFinished:
     case EventKind::kProgress:
         break;
@@ -276,6 +277,11 @@ std::optional<Failure> Conversion::Verdict() {
         return Failure(ExitCode::kCannotRead,
                        fmt::format("reading \"{}\" failed after {}: {}; what was read is converted",
                                    options_.input, FormatTime(options_.begin + position_, true), reason));
+    }
+    if (outcome_ == kOutcomeFailed) {
+        return Failure(ExitCode::kInternal,
+                       fmt::format("the conversion broke off after {}, for want of memory",
+                                   FormatTime(options_.begin + position_, true)));
     }
     return std::nullopt;
 }

@@ -47,7 +47,7 @@ private:
 
     void WarnOfSmallRoom();
     void WaitForEnd();
-    void Handle(const Event& event);
+    void Handle(EventKind event);
     void TakeNews();
     void Stop();
     void TogglePause();

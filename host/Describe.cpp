@@ -8,10 +8,22 @@
 namespace host {
 namespace {
 
-std::string DescribePictures(const PictureStreamInfo& pictures) {
-    std::string text = fmt::format("pictures:  {}, {} x {}, {:.3f} a second, {}, {}", pictures.codec,
+std::string DescribeLength(double seconds, Certainty certainty) {
+    switch (certainty) {
+    case Certainty::kGuessed:
+        return "unknown";
+    case Certainty::kEstimated:
+        return "about " + FormatTime(std::round(seconds));
+    case Certainty::kKnown:
+        break;
+    }
+    return FormatTime(seconds, true);
+}
+
+std::string DescribePictures(const PictureStreamInfo& pictures, Certainty certainty) {
+    std::string text = fmt::format("pictures:  {}, {} x {}, {:.3f} a second, {}, length {}", pictures.codec,
                                    pictures.width, pictures.height, pictures.frameRate, pictures.pixelFormat,
-                                   FormatTime(pictures.duration, true));
+                                   DescribeLength(pictures.duration, certainty));
     if (pictures.pixelAspect.num != pictures.pixelAspect.den)
         text += fmt::format(", pixels {}:{}", pictures.pixelAspect.num, pictures.pixelAspect.den);
     if (pictures.quarterTurns != 0 || pictures.mirrored) {
@@ -21,29 +33,19 @@ std::string DescribePictures(const PictureStreamInfo& pictures) {
     return text + (pictures.interlaced ? ", interlaced\n" : "\n");
 }
 
-std::string DescribeLength(const SourceInfo& source) {
-    switch (source.certainty) {
-    case Certainty::kGuessed:
-        return "unknown";
-    case Certainty::kEstimated:
-        return "about " + FormatTime(std::round(source.duration));
-    case Certainty::kKnown:
-        break;
-    }
-    return FormatTime(source.duration, true);
-}
-
 } // namespace
 
 std::string Describe(const SourceInfo& source) {
     std::string text = fmt::format("file:      {} ({})\ncontainer: {}\nlength:    {}\n", source.path,
-                                   FormatBytes(source.bytes), source.container, DescribeLength(source));
-    text += source.pictures ? DescribePictures(*source.pictures) : "pictures:  none\n";
+                                   FormatBytes(source.bytes), source.container,
+                                   DescribeLength(source.duration, source.certainty));
+    text += source.pictures ? DescribePictures(*source.pictures, source.certainty) : "pictures:  none\n";
     if (source.sound) {
         const int channels = source.sound->channels;
-        text += fmt::format("sound:     {}, {} Hz, {} ({} channel{}), {}\n", source.sound->codec,
-                            source.sound->sampleRate, source.sound->layout, channels,
-                            channels == 1 ? "" : "s", FormatTime(source.sound->duration, true));
+        text +=
+            fmt::format("sound:     {}, {} Hz, {} ({} channel{}), length {}\n", source.sound->codec,
+                        source.sound->sampleRate, source.sound->layout, channels, channels == 1 ? "" : "s",
+                        DescribeLength(source.sound->duration, source.certainty));
     } else {
         text += "sound:     none\n";
     }

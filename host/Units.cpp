@@ -9,6 +9,8 @@
 namespace host {
 namespace {
 
+constexpr double kMostSeconds = 1e9; // thirty years; keeps sums of 100 ns units far from their limit
+
 /// A plain non-negative decimal number, whatever the locale.
 std::optional<double> ParseNumber(std::string_view text) {
     double value = 0;
@@ -39,7 +41,7 @@ std::optional<double> ParseTime(std::string_view text) {
         text.remove_prefix(colon + 1);
     }
     const auto seconds = ParseNumber(text);
-    if (!seconds || (colons > 0 && *seconds >= 60))
+    if (!seconds || (colons > 0 && *seconds >= 60) || whole + *seconds > kMostSeconds)
         return std::nullopt;
     return whole + *seconds;
 }
@@ -84,8 +86,7 @@ std::optional<double> ParseFrameRate(std::string_view text) {
 }
 
 std::string FormatTime(double seconds, bool milliseconds) {
-    constexpr double kMost = 1e9;
-    const double bounded = std::isfinite(seconds) ? std::clamp(seconds, 0.0, kMost) : 0;
+    const double bounded = std::isfinite(seconds) ? std::clamp(seconds, 0.0, kMostSeconds) : 0;
     const auto ms =
         static_cast<int64_t>(milliseconds ? std::llround(bounded * 1000) : std::floor(bounded) * 1000);
     const std::string text = fmt::format("{}:{:02}:{:02}", ms / 3'600'000, ms / 60'000 % 60, ms / 1000 % 60);
