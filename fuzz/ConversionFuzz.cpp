@@ -159,7 +159,8 @@ private:
         if (input.ConsumeIntegralInRange(0, 31) == 0)
             return std::nullopt;
         AudioFrame frame{};
-        frame.nType = input.ConsumeBool() ? kMediaTypeSound : 0; // never that of silence, which the engine makes
+        frame.nType =
+            input.ConsumeBool() ? kMediaTypeSound : 0; // never that of silence, which the engine makes
         frame.nSampleRate = WildInteger(input, 8000);
         frame.nChannels = WildInteger(input, 2);
         frame.nBitsPerSample = WildInteger(input, 16);
