@@ -117,11 +117,11 @@ av::Packet Demuxer::Take(int stream) {
 }
 
 void Demuxer::Stop() {
-    source_.Interrupt();
     {
         const std::lock_guard lock(mutex_);
-        stopping_ = true;
+        stopping_ = true; // before the read is interrupted, which is no failure then
     }
+    source_.Interrupt();
     changed_.notify_all();
 }
 
