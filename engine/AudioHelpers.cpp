@@ -1,6 +1,7 @@
 #include "engine/AudioHelpers.h"
 
 #include "engine/Arithmetic.h"
+#include "media/MediaRecords.h"
 
 #include <cstring>
 
@@ -19,8 +20,9 @@ int32_t PieceLength(const AudioFrame& block, int32_t left) {
 
 /// Time that `bytes` take, in 100 ns units.
 int32_t Duration(int32_t bytes, int32_t bytesPerSecond) {
-    return bytesPerSecond == 0 ? 0
-                               : Truncate<int32_t>(static_cast<double>(bytes) / bytesPerSecond * 10000000);
+    return bytesPerSecond == 0
+               ? 0
+               : Truncate<int32_t>(static_cast<double>(bytes) / bytesPerSecond * kTicksPerSecond);
 }
 
 } // namespace

@@ -13,7 +13,6 @@
 
 namespace {
 
-constexpr int64_t kTicksPerSecond = 10000000;
 constexpr int32_t kSilenceStep = 400000; // 40 ms
 constexpr int32_t kSilenceSize = 1 << 20;
 
@@ -190,8 +189,8 @@ void ConvThread::AudioVideoLoop::WriteSilentBlocks(int32_t gap) {
     block.llTime = llAudioOut;
     for (int32_t covered = 0; covered < gap; covered += block.nDuration) {
         const int32_t step = std::min(gap - covered, kSilenceStep);
-        const double bytes =
-            step / 10000000.0 * param.nSampleRate * param.nChannels * param.nBitsPerSample * 0.125;
+        const double bytes = static_cast<double>(step) / kTicksPerSecond * param.nSampleRate *
+                             param.nChannels * param.nBitsPerSample * 0.125;
         block.nLength = std::clamp(Truncate<int32_t>(bytes + 0.5), 0, kSilenceSize);
         block.nDuration = step;
         MWWriteAudioData(hFile, &block);
@@ -201,7 +200,7 @@ void ConvThread::AudioVideoLoop::WriteSilentBlocks(int32_t gap) {
         llAudioSrc = WrapAdd<int64_t>(llAudioSrc, step);
     }
     llAudioOut = WrapAdd<int64_t>(llAudioOut, gap);
-    dPosition += gap / 10000000.0;
+    dPosition += static_cast<double>(gap) / kTicksPerSecond;
 }
 
 void ConvThread::AudioVideoLoop::WritePicture(const VideoImage& picture) {

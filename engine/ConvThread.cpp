@@ -75,6 +75,7 @@ struct FourCCText {
     wchar_t text[5] = {};
 };
 
+/// The lines of the log are part of the interface, down to the spelling; see docs/abi.md.
 void LogEncodeParam(const EncodeParam& param) {
     LogEx(L"Halvane::SetEncodeParam: Flie format[%ls], Video[%ls] (%dx%d) %ffps, %dbps %d %dbps "
           L"Resize:%d\t\tAudio[%ls]%dchannels %dHz , %dbps %d %dbps",

@@ -108,7 +108,7 @@ void ConvThread::VideoLoop::MoveTo(int64_t time) {
     if (llOrigin == kNoTime)
         llOrigin = time;
     if (time != kNoTime)
-        dPosition = static_cast<double>(WrapSub(time, llOrigin)) / 10000000.0;
+        dPosition = static_cast<double>(WrapSub(time, llOrigin)) / kTicksPerSecond;
 }
 
 void ConvThread::VideoLoop::Estimate(uint32_t now) {

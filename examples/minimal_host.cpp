@@ -11,7 +11,6 @@
 constexpr int kWidth = 320, kHeight = 240, kPictures = 75, kPicturesPerSecond = 25;
 constexpr int kSampleRate = 44100, kBlockSamples = 441;
 constexpr double kSeconds = 1.0 * kPictures / kPicturesPerSecond;
-constexpr int64_t kTicks = 10'000'000; // media time counts 100 ns
 
 /// A grey gradient that wanders to the left.
 class Pictures final : public VideoDecoder {
@@ -26,14 +25,14 @@ public:
         image.nWidth = image.nPitchY = kWidth;
         image.nHeight = kHeight;
         image.nPitchU = image.nPitchV = kWidth / 2;
-        image.nDuration = kTicks / kPicturesPerSecond;
+        image.nDuration = kTicksPerSecond / kPicturesPerSecond;
     }
     VideoSourceInfo* GetVideoInfo() override { return &info; }
     double Seek(double seconds, int) override { return number = int(seconds * kPicturesPerSecond); }
     VideoImage* GetCurrentImage() override {
         for (int i = 0; i < kWidth * kHeight; ++i)
             luma[i] = (unsigned char)(16 + (i % kWidth + i / kWidth + 2 * number) % 220);
-        image.llTime = image.llTime2 = number * kTicks / kPicturesPerSecond;
+        image.llTime = image.llTime2 = number * kTicksPerSecond / kPicturesPerSecond;
         return number < kPictures ? &image : nullptr;
     }
     int DecodeNext(int) override { return ++number < kPictures ? 1 : 0; }
@@ -50,19 +49,20 @@ class Sound final : public AudioDecoder {
 public:
     Sound() {
         info.format = {kSampleRate, 1, 16, 2 * kSampleRate, kSeconds};
+        block.nType = kMediaTypeSound;
         block.nSampleRate = kSampleRate;
         block.nChannels = 1;
         block.nBitsPerSample = 16;
         block.pData = (unsigned char*)samples.data();
         block.nLength = block.nBufferSize = sizeof samples;
-        block.nDuration = kBlockSamples * kTicks / kSampleRate;
+        block.nDuration = kBlockSamples * kTicksPerSecond / kSampleRate;
     }
     AudioSourceInfo* GetAudioInfo() override { return &info; }
     double Seek(double seconds) override { return position = int(seconds * kSampleRate); }
     AudioFrame* GetNextFrame() override {
         for (int i = 0; i < kBlockSamples; ++i)
             samples[i] = short(8000 * std::sin(6.283185307 * 441 * (position + i) / kSampleRate));
-        block.llTime = block.llTime2 = position * kTicks / kSampleRate;
+        block.llTime = block.llTime2 = position * kTicksPerSecond / kSampleRate;
         position += kBlockSamples;
         return position <= kSeconds * kSampleRate ? &block : nullptr;
     }

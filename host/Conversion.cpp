@@ -3,6 +3,7 @@
 #include "host/EncodePlan.h"
 #include "host/OutputCheck.h"
 #include "host/Units.h"
+#include "text/Path.h"
 #include "text/Utf8.h"
 
 #include <algorithm>
@@ -92,7 +93,7 @@ void Conversion::WarnOfSmallRoom() {
     EncodeParam param{};
     MCGetEncodeParam(converter_.get(), &param);
     const int64_t needed = MCGetEstimateDiskSpaceEx(&param, length_);
-    const int64_t free = FreeBytes(FolderOf(options_.output));
+    const int64_t free = FreeBytes(text::FolderOf(options_.output));
     if (free >= 0 && free < needed) {
         reporter_.Warning(fmt::format("\"{}\" needs about {}, but only {} are free", options_.output,
                                       FormatBytes(needed), FormatBytes(free)));

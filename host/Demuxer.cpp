@@ -13,11 +13,11 @@ namespace {
 
 constexpr std::size_t kEnoughPackets = 32;
 constexpr std::size_t kEnoughBytes = 16 << 20;
-constexpr int kToleratedFailures = 100;             // reads in a row that may fail on damaged data
-constexpr int64_t kLargestStep = 10 * kMediaSecond; // between packets of one stream; more is a new clock
-constexpr int64_t kLargestFall = kMediaSecond / 2;  // likewise, backwards
-constexpr double kPreroll = 0.2;                    // codecs need a little before the first good sample
-constexpr int kProbedPackets = 2000;                // read to find the picture where decoding can begin
+constexpr int kToleratedFailures = 100;                // reads in a row that may fail on damaged data
+constexpr int64_t kLargestStep = 10 * kTicksPerSecond; // between packets of one stream; more is a new clock
+constexpr int64_t kLargestFall = kTicksPerSecond / 2;  // likewise, backwards
+constexpr double kPreroll = 0.2;                       // codecs need a little before the first good sample
+constexpr int kProbedPackets = 2000;                   // read to find the picture where decoding can begin
 
 /// Writes what went wrong into `reason`, which stays as it is when there is no memory for it.
 void Describe(const std::exception& error, std::string& reason) noexcept {
@@ -218,7 +218,7 @@ void Demuxer::RepairClock(AVPacket& packet) {
     if ((source_.Context()->iformat->flags & AVFMT_TS_DISCONT) == 0 || packet.dts == AV_NOPTS_VALUE)
         return;
     const AVStream* stream = source_.Context()->streams[packet.stream_index];
-    const AVRational mediaBase{1, kMediaSecond};
+    const AVRational mediaBase{1, kTicksPerSecond};
     const int64_t stamp = av_rescale_q(packet.dts, stream->time_base, mediaBase);
     const auto due = due_.find(packet.stream_index);
     int64_t shift = clockShift_;

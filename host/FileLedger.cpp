@@ -2,6 +2,7 @@
 
 #include "host/OutputCheck.h"
 #include "host/Units.h"
+#include "text/Path.h"
 
 #include <algorithm>
 #include <cmath>
@@ -40,7 +41,7 @@ std::string TextOf(const WriterStatus& failure) {
         std::strstr(failure.szWhat, std::strerror(failure.nSystemError)) == nullptr)
         text += fmt::format(" ({})", std::strerror(failure.nSystemError));
     if (failure.nError == kWriterErrorNoSpace) {
-        const int64_t free = FreeBytes(FolderOf(failure.szPath));
+        const int64_t free = FreeBytes(text::FolderOf(failure.szPath));
         text += fmt::format("; {} were written, {} are free: make room or choose another disk",
                             FormatBytes(failure.llBytesWritten), FormatBytes(free > 0 ? free : 0));
     } else if (failure.nError == kWriterErrorCodec || failure.nError == kWriterErrorFormat) {

@@ -2,18 +2,18 @@
 #ifndef MOVIECONV_HOST_MEDIATIME_H
 #define MOVIECONV_HOST_MEDIATIME_H
 
+#include "media/MediaRecords.h"
+
 #include <cmath>
 #include <cstdint>
 
 namespace host {
 
-constexpr int64_t kMediaSecond = 10'000'000;
-
 inline int64_t ToMediaTime(double seconds) {
-    return std::llround(seconds * kMediaSecond);
+    return std::llround(seconds * kTicksPerSecond);
 }
 inline double ToSeconds(int64_t mediaTime) {
-    return static_cast<double>(mediaTime) / kMediaSecond;
+    return static_cast<double>(mediaTime) / kTicksPerSecond;
 }
 
 } // namespace host

@@ -2,6 +2,7 @@
 
 #include "api/MovieConv.h"
 #include "host/ExitCode.h"
+#include "text/Path.h"
 #include "text/Utf8.h"
 
 #include <algorithm>
@@ -104,7 +105,7 @@ void CheckClips(const Options& options, const struct stat* input) {
             ExitCode::kUsage,
             fmt::format("the name \"{}\" is too long to number clips; choose a shorter one", options.output));
     }
-    const std::string folder = FolderOf(options.output);
+    const std::string folder = text::FolderOf(options.output);
     const std::unique_ptr<DIR, int (*)(DIR*)> listing(opendir(folder.c_str()), closedir);
     while (const dirent* entry = listing ? readdir(listing.get()) : nullptr)
         if (IsClipName(entry->d_name, base, extension))
@@ -122,7 +123,7 @@ bool AreSame(const std::string& path, const std::string& other) {
 bool IsOutput(const std::string& path, const Options& options) {
     if (AreSame(path, options.output))
         return true;
-    if (!AreSame(FolderOf(path), FolderOf(options.output)))
+    if (!AreSame(text::FolderOf(path), text::FolderOf(options.output)))
         return false;
     std::string name = NameOf(path);
     for (const std::string_view suffix : {".joined.part", ".part"})
@@ -145,13 +146,6 @@ void CheckSideFile(const char* option, const std::string& path, const Options& o
 
 } // namespace
 
-std::string FolderOf(const std::string& path) {
-    const std::size_t slash = path.rfind('/');
-    if (slash == std::string::npos)
-        return ".";
-    return slash == 0 ? "/" : path.substr(0, slash);
-}
-
 int64_t FreeBytes(const std::string& folder) {
     struct statvfs status {};
     if (statvfs(folder.c_str(), &status) != 0 || status.f_blocks == 0)
@@ -162,7 +156,7 @@ int64_t FreeBytes(const std::string& folder) {
 void CheckOutput(const Options& options) {
     struct stat inputStatus {};
     const struct stat* input = stat(options.input.c_str(), &inputStatus) == 0 ? &inputStatus : nullptr;
-    CheckFolder(FolderOf(options.output));
+    CheckFolder(text::FolderOf(options.output));
     if (options.split)
         CheckClips(options, input);
     else

@@ -17,9 +17,6 @@ void CheckOutput(const Options& options);
 /// its temporary file, or over each other.
 void CheckSideFiles(const Options& options);
 
-/// The folder of a path, "." for a plain name.
-std::string FolderOf(const std::string& path);
-
 /// Bytes that an ordinary user can still write to the file system of `folder`; -1 when it cannot be told.
 int64_t FreeBytes(const std::string& folder);
 

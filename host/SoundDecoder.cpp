@@ -97,9 +97,10 @@ AudioFrame* SoundDecoder::GetNextFrame() {
     block_.pData = current_.data() + used_;
     block_.nLength = static_cast<int32_t>(bytes);
     block_.nBufferSize = static_cast<int32_t>(left);
-    block_.llTime = block_.llTime2 = begin_ + av_rescale(samplesDelivered_, kMediaSecond, format.nSampleRate);
+    block_.llTime = block_.llTime2 =
+        begin_ + av_rescale(samplesDelivered_, kTicksPerSecond, format.nSampleRate);
     block_.nDuration =
-        static_cast<int32_t>(av_rescale(bytes / frameBytes_, kMediaSecond, format.nSampleRate));
+        static_cast<int32_t>(av_rescale(bytes / frameBytes_, kTicksPerSecond, format.nSampleRate));
     used_ += bytes;
     samplesDelivered_ += bytes / frameBytes_;
     return &block_;

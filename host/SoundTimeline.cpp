@@ -14,7 +14,7 @@ namespace host {
 SoundTimeline::Placement SoundTimeline::Place(std::optional<int64_t> stamp, int64_t samples) {
     Placement placement;
     if (stamp) {
-        const int64_t offset = av_rescale(*stamp - begin_, sampleRate_, kMediaSecond) - position_;
+        const int64_t offset = av_rescale(*stamp - begin_, sampleRate_, kTicksPerSecond) - position_;
         if (position_ == 0 || IsGap(offset)) {
             placement.silence = std::max<int64_t>(offset, 0);
             placement.cut = std::clamp<int64_t>(-offset, 0, samples);

@@ -152,7 +152,7 @@ void Source::Open() {
     if (found < 0)
         throw SourceError("cannot read the streams of \"" + path + "\": " + av::ErrorText(found));
     if (context->start_time != AV_NOPTS_VALUE)
-        start_ = av_rescale_q(context->start_time, {1, AV_TIME_BASE}, {1, kMediaSecond});
+        start_ = av_rescale_q(context->start_time, {1, AV_TIME_BASE}, {1, kTicksPerSecond});
     info_.container =
         context->iformat->long_name != nullptr ? context->iformat->long_name : context->iformat->name;
     ChooseStreams();
@@ -287,7 +287,7 @@ void Source::FindDuration() {
     if (info_.duration > 0 && AnnouncesItsEnd(*input_->iformat))
         info_.duration -= ToSeconds(start_);
     // ASF has its length from whoever wrote it, who may have taken the last stamp for it.
-    const bool doubtful = av_match_name("asf", input_->iformat->name) != 0 && start_ > kMediaSecond;
+    const bool doubtful = av_match_name("asf", input_->iformat->name) != 0 && start_ > kTicksPerSecond;
     const bool measured = info_.duration <= 0 || guessedByRate || doubtful;
     if (measured)
         MeasureDuration();
@@ -411,7 +411,7 @@ const AVStream* Source::SoundStream() const {
 
 int64_t Source::MediaTime(int64_t stamp, const AVStream* stream) const {
     constexpr int64_t kFarthest = int64_t{1} << 60; // room for sums with what damaged stamps tell
-    return std::clamp(av_rescale_q(stamp, stream->time_base, {1, kMediaSecond}), -kFarthest, kFarthest) -
+    return std::clamp(av_rescale_q(stamp, stream->time_base, {1, kTicksPerSecond}), -kFarthest, kFarthest) -
            start_;
 }
 

@@ -2,6 +2,7 @@
 
 #include "host/HostEvents.h"
 #include "host/OutputCheck.h"
+#include "text/Path.h"
 
 #include <cerrno>
 #include <chrono>
@@ -102,7 +103,7 @@ int WriterWatch::OnFullDisk(void* context, const WriterStatus* status) {
 
 /// Nothing announces free space, so it is asked for every second.
 int WriterWatch::WaitForRoom(const WriterStatus& status) {
-    const std::string folder = FolderOf(status.szPath);
+    const std::string folder = text::FolderOf(status.szPath);
     waiting_ = true;
     PostHostEvent(EventKind::kWriterNews);
     bool givenUp = false;

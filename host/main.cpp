@@ -7,6 +7,7 @@
 #include "host/Reporter.h"
 #include "host/StandardStreams.h"
 #include "host/Units.h"
+#include "text/Path.h"
 
 #include <cerrno>
 #include <cstdio>
@@ -54,7 +55,7 @@ ExitCode Estimate(const Options& options, Movie& movie, const StandardStreams& s
     EncodeParam param{};
     MCGetEncodeParam(converter.get(), &param);
     const int64_t needed = MCGetEstimateDiskSpaceEx(&param, length);
-    const std::string folder = FolderOf(options.output);
+    const std::string folder = text::FolderOf(options.output);
     const int64_t free = FreeBytes(folder);
     PrintWhole(streams, fmt::format("needs about {} for {} of output\n", FormatBytes(needed),
                                     FormatTime(length, true)));

@@ -8,6 +8,9 @@
 
 #ifdef __cplusplus
 #include <cstddef>
+
+/// Time stamps and durations count 100 ns.
+constexpr int64_t kTicksPerSecond = 10000000;
 #endif
 
 #pragma pack(push, 4)

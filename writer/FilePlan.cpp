@@ -1,6 +1,6 @@
 #include "writer/FilePlan.h"
 
-#include "writer/MediaTime.h"
+#include "media/MediaRecords.h"
 #include "writer/WriterFailure.h"
 
 extern "C" {
@@ -114,7 +114,7 @@ VideoPlan MakeVideoPlan(const EncodeParam& param, const VideoFormat& source, con
     const double rate = av_q2d(plan.settings.rate);
     plan.keepStamps = sourceRate > 0.0 && SameRate(rate, sourceRate);
     plan.pictureLength =
-        std::llround(static_cast<double>(kUnitsPerSecond) / (sourceRate > 0.0 ? sourceRate : rate));
+        std::llround(static_cast<double>(kTicksPerSecond) / (sourceRate > 0.0 ? sourceRate : rate));
     return plan;
 }
 

@@ -1,7 +1,8 @@
 #include "writer/MediaFile.h"
 
+#include "media/MediaRecords.h"
+#include "text/Path.h"
 #include "writer/Fragments.h"
-#include "writer/MediaTime.h"
 
 #include <algorithm>
 #include <cerrno>
@@ -63,7 +64,7 @@ MediaFile::MediaFile(const std::string& target, const EncodeParam& param, const 
       target_(ResolveTarget(target)),
       record_(std::move(record)),
       files_(files),
-      stamps_(plan_.video ? plan_.video->pictureLength : kUnitsPerSecond, plan_.video.has_value()) {
+      stamps_(plan_.video ? plan_.video->pictureLength : kTicksPerSecond, plan_.video.has_value()) {
     const int obstacle = CheckTarget(target_);
     if (obstacle == EEXIST && record_->Options().bKeepExisting != 0)
         throw WriterFailure(kWriterErrorExists, "The file exists already.", EEXIST);
@@ -89,7 +90,7 @@ void MediaFile::OpenPart() {
     std::unique_ptr<ByteFile> file = CreateBeside(files_, target_, ".part", path, error);
     if (!file)
         throw SystemFailure(kWriterErrorOpen, error, "No file can be created in the folder \"%s\"",
-                            FolderOf(target_).c_str());
+                            text::FolderOf(target_).c_str());
     partPath_ = std::move(path);
     part_ = std::make_unique<AvioFile>(std::move(file), AvioFile::Mode::kWrite,
                                        [this] { return record_->AskAboutFullDisk(); });
@@ -151,7 +152,7 @@ bool MediaFile::WriteVideo(const VideoImage& image) {
         ++status.llPicturesReceived;
         status.llStampsRepaired = stamps_.Repairs();
         status.dVideoReceived =
-            static_cast<double>(time - *firstPicture_ + plan_.video->pictureLength) / kUnitsPerSecond;
+            static_cast<double>(time - *firstPicture_ + plan_.video->pictureLength) / kTicksPerSecond;
     });
     try {
         StartSoundIfKnown();
@@ -178,7 +179,7 @@ bool MediaFile::AddSound(const AudioFrame& frame, const PcmFormat& format) {
     stamps_.AddSound(frame.llTime, frame.nLength, format.BytesPerSecond(), frame.nType == kMediaTypeSilence);
     record_->Update([&](WriterStatus& status) {
         status.llSamplesReceived += frame.nLength / format.BytesPerFrame();
-        status.dAudioReceived = static_cast<double>(stamps_.SoundLength()) / kUnitsPerSecond;
+        status.dAudioReceived = static_cast<double>(stamps_.SoundLength()) / kTicksPerSecond;
     });
     if (waiting_.empty() || !(waiting_.back().format == format))
         waiting_.push_back({format, {}});

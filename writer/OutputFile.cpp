@@ -139,13 +139,6 @@ std::string ResolveTarget(const std::string& path) {
     return real ? std::string(real.get()) : path;
 }
 
-std::string FolderOf(const std::string& path) {
-    const size_t slash = path.rfind('/');
-    if (slash == std::string::npos)
-        return ".";
-    return slash == 0 ? "/" : path.substr(0, slash);
-}
-
 std::unique_ptr<ByteFile> CreateBeside(FileSystem& files, const std::string& target,
                                        const std::string& suffix, std::string& path, int& error) {
     constexpr int kMostNumbers = 1000;

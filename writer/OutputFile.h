@@ -63,9 +63,6 @@ std::string ResolveTarget(const std::string& path);
 std::unique_ptr<ByteFile> CreateBeside(FileSystem& files, const std::string& target,
                                        const std::string& suffix, std::string& path, int& error);
 
-/// The folder of `path`, "." when it names none.
-std::string FolderOf(const std::string& path);
-
 } // namespace writer
 
 #endif

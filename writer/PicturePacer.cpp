@@ -1,6 +1,6 @@
 #include "writer/PicturePacer.h"
 
-#include "writer/MediaTime.h"
+#include "media/MediaRecords.h"
 
 extern "C" {
 #include <libavutil/mathematics.h>
@@ -13,10 +13,10 @@ extern "C" {
 namespace writer {
 namespace {
 
-constexpr AVRational kUnit{1, static_cast<int>(kUnitsPerSecond)};
+constexpr AVRational kUnit{1, kTicksPerSecond};
 
 /// Sources whose stamps are rounded to milliseconds still mean a steady rate.
-constexpr int64_t kGridTolerance = 2 * kUnitsPerSecond / 1000;
+constexpr int64_t kGridTolerance = 2 * kTicksPerSecond / 1000;
 
 } // namespace
 

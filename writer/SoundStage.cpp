@@ -1,6 +1,6 @@
 #include "writer/SoundStage.h"
 
-#include "writer/MediaTime.h"
+#include "media/MediaRecords.h"
 
 #include <algorithm>
 #include <optional>
@@ -55,7 +55,7 @@ void SoundStage::Join() {
 }
 
 void SoundStage::Run(int64_t start) {
-    int64_t shift = av_rescale(start, Encoder().sample_rate, kUnitsPerSecond);
+    int64_t shift = av_rescale(start, Encoder().sample_rate, kTicksPerSecond);
     int64_t silence = fillsStart_ ? std::exchange(shift, 0) : 0;
     const PacketTaker take = [this, shift](AVPacket& packet) {
         packet.pts += shift;

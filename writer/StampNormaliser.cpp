@@ -1,6 +1,6 @@
 #include "writer/StampNormaliser.h"
 
-#include "writer/MediaTime.h"
+#include "media/MediaRecords.h"
 
 #include <algorithm>
 #include <cstdlib>
@@ -9,15 +9,15 @@ namespace writer {
 namespace {
 
 /// Sound that may come before the first picture of a file until the file is taken to begin with its sound.
-constexpr int64_t kLongestWait = 10 * kUnitsPerSecond;
+constexpr int64_t kLongestWait = 10 * kTicksPerSecond;
 
 /// How far ahead of all sound a picture can be and still be on the sound's timeline: sound is always written
 /// first.
-constexpr int64_t kFarthestAhead = kUnitsPerSecond / 2;
+constexpr int64_t kFarthestAhead = kTicksPerSecond / 2;
 
 /// The longest that one picture stands, or sound begins before or after the pictures. A stamp that says more
 /// is wrong: following it could take a file of any size.
-constexpr int64_t kLongestGap = int64_t{6} * 3600 * kUnitsPerSecond;
+constexpr int64_t kLongestGap = int64_t{6} * 3600 * kTicksPerSecond;
 
 /// Distance of two stamps. Stamps can be anything; one that is farther off than times can add up to is wrong
 /// anyway.
@@ -40,7 +40,7 @@ int64_t StampNormaliser::SoundLength() const {
     // Split, so that the product fits for any byte rate and length.
     const int64_t seconds = segmentBytes_ / bytesPerSecond_;
     const int64_t rest = segmentBytes_ % bytesPerSecond_;
-    return segmentStart_ + seconds * kUnitsPerSecond + rest * kUnitsPerSecond / bytesPerSecond_;
+    return segmentStart_ + seconds * kTicksPerSecond + rest * kTicksPerSecond / bytesPerSecond_;
 }
 
 void StampNormaliser::AddSound(int64_t stamp, int64_t bytes, int64_t bytesPerSecond, bool silence) {

@@ -61,7 +61,7 @@ TEST(StampRepair, GivesTheDistanceToTheNextPictureAsDuration) {
 constexpr int kRate = 1000; // samples a second: a sample is a millisecond
 
 int64_t Ms(int64_t milliseconds) {
-    return milliseconds * (host::kMediaSecond / 1000);
+    return milliseconds * (kTicksPerSecond / 1000);
 }
 
 void ExpectPlaced(const SoundTimeline::Placement& placement, int64_t silence, int64_t cut) {
