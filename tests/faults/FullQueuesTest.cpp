@@ -1,4 +1,4 @@
-// MCStop with the real media writer while the disk takes nothing and the queue before it is full.
+// A stop with the real media writer while the disk takes nothing and the queue before it is full.
 #include "api/MovieConv.h"
 #include "tests/engine/IdleParts.h"
 #include "tests/support/Folder.h"
@@ -7,10 +7,8 @@
 
 #include <gtest/gtest.h>
 
-#include <atomic>
 #include <chrono>
 #include <filesystem>
-#include <memory>
 #include <string>
 #include <thread>
 #include <vector>
@@ -26,20 +24,14 @@ Gate g_disk;
 /// What the picture encoder's full queue holds, and the picture that waits for room in it.
 constexpr int64_t kPicturesHeld = 3 + 1;
 
-std::unique_ptr<WriterStatus> Status() {
-    auto status = std::make_unique<WriterStatus>();
-    MWGetFileStatus(MWGetFileCount(), status.get());
+WriterStatus Status() {
+    WriterStatus status{};
+    MWGetFileStatus(MWGetFileCount(), &status);
     return status;
 }
 
-void AwaitPictures(int64_t pictures) {
-    while (Status()->llPicturesWritten < pictures)
-        std::this_thread::sleep_for(std::chrono::milliseconds(1));
-}
-
-void AwaitFullQueue() {
-    for (auto status = Status(); status->llPicturesReceived - status->llPicturesWritten < kPicturesHeld;
-         status = Status())
+void AwaitStatus(bool (*reached)(const WriterStatus& status)) {
+    while (!reached(Status()))
         std::this_thread::sleep_for(std::chrono::milliseconds(1));
 }
 
@@ -61,26 +53,20 @@ TEST(FullQueuesTest, AStopWaitsForTheDiskAndFinishesWhatWasTaken) {
         MCCreate(&video, nullptr); // beside sound, the queue that is full first keeps the other empty
     MCSetOutputFile(handle, std::filesystem::path(folder / "out.mp4").wstring().c_str());
     ASSERT_EQ(MCStart(handle, 0.0, 0.0, nullptr, nullptr, nullptr), 0);
-    AwaitPictures(100);
+    AwaitStatus([](const WriterStatus& status) { return status.llPicturesWritten >= 100; });
     g_disk.Shut();
     g_disk.AwaitHeld();
-    AwaitFullQueue();
-
-    std::atomic<bool> back{false};
-    std::thread stopper([&] {
-        MCStop(handle);
-        back = true;
+    AwaitStatus([](const WriterStatus& status) {
+        return status.llPicturesReceived - status.llPicturesWritten >= kPicturesHeld;
     });
-    while (!back && MCPause(handle) != 0) // 0 once the stop has been asked for
-        MCResume(handle);
-    EXPECT_EQ(MCWait(handle, 100), MC_WAIT_TIMEOUT);
-    EXPECT_FALSE(back) << "the disk takes nothing";
+
+    EXPECT_EQ(MCAbort(handle), 1);
+    EXPECT_EQ(MCWait(handle, 100), MC_WAIT_TIMEOUT) << "the disk takes nothing";
     g_disk.Open();
-    stopper.join();
-    EXPECT_EQ(MCWait(handle, 0), 0);
+    EXPECT_EQ(MCWait(handle, MC_INFINITE), 0);
     MCDestroy(handle);
 
-    EXPECT_EQ(Status()->nState, kWriterFileComplete);
-    EXPECT_EQ(Status()->llPicturesWritten, Status()->llPicturesReceived);
+    EXPECT_EQ(Status().nState, kWriterFileComplete);
+    EXPECT_EQ(Status().llPicturesWritten, Status().llPicturesReceived);
     EXPECT_EQ(folder.Names(), std::vector<std::string>{"out.mp4"});
 }
