@@ -412,7 +412,7 @@ void FuzzConversion(FuzzedDataProvider& input) {
         const int started = host.Start(WildDouble(input, 0.0), WildDouble(input, 0.0));
         FUZZ_CHECK(MCWait(host.handle, MC_INFINITE) == (host.handle ? 0 : -1));
         if (started != 0) {
-            FUZZ_CHECK(TraceWithoutLog().empty());
+            FUZZ_CHECK(Trace(Part::kWithoutLog).empty());
             continue;
         }
         Inspection inspection(video, audio, host.hasCallback);

@@ -27,58 +27,43 @@ private:
     size_t next = 0;
 };
 
-struct Piece {
-    size_t block;
-    int32_t offset, length;
-    int64_t time;
-    int32_t duration;
-};
-
-class SmallFrameTest : public testing::Test {
-protected:
-    SmallFrameTest() { get_small_frame(nullptr); }
-
-    void ExpectPieces(const std::vector<Piece>& pieces) {
-        for (const auto& [block, offset, length, time, duration] : pieces) {
-            SCOPED_TRACE(testing::Message() << "block " << block << " from " << offset);
-            const AudioFrame* frame = get_small_frame(&decoder);
-            ASSERT_NE(frame, nullptr);
-            AudioFrame expected = decoder.blocks[block];
-            expected.pData += offset;
-            expected.nLength = expected.nBufferSize = length;
-            expected.llTime2 = expected.llTime = time;
-            expected.nDuration = duration;
-            EXPECT_TRUE(SameBytes(*frame, expected));
-        }
-    }
-
+TEST(SmallFrameTest, CutsPiecesOf30MillisecondsFrom50OnUntilItIsReset) {
     Blocks decoder;
-};
-
-TEST_F(SmallFrameTest, CutsPiecesOf30MillisecondsFrom50On) {
     decoder.Add(44100, 2, 16, 14112, 1000); // 80 ms
     decoder.Add(8000, 1, 8, 400, 0);        // 50 ms
     decoder.Add(8000, 1, 8, 399, 900000);
     decoder.Add(8000, 1, 8, 0, 5);
     decoder.Add(8000, 1, 8, 1, -20);
-    ExpectPieces({{0, 0, 5292, 1000, 300000},
-                  {0, 5292, 5292, 301000, 300000},
-                  {0, 10584, 3528, 601000, 200000},
-                  {1, 0, 240, 0, 300000},
-                  {1, 240, 160, 300000, 200000},
-                  {2, 0, 399, 900000, 498750},
-                  {3, 0, 0, 5, 0},
-                  {4, 0, 1, -20, 1250}});
-    EXPECT_EQ(get_small_frame(&decoder), nullptr);
-    EXPECT_EQ(get_small_frame(&decoder), nullptr);
-}
-
-TEST_F(SmallFrameTest, ResetForgetsTheBlock) {
     decoder.Add(8000, 1, 8, 800, 0);
-    decoder.Add(8000, 1, 8, 100, 7);
-    ExpectPieces({{0, 0, 240, 0, 300000}});
-    EXPECT_EQ(get_small_frame(nullptr), nullptr);
-    ExpectPieces({{1, 0, 100, 7, 125000}});
+    constexpr struct {
+        size_t block;
+        int32_t offset, length;
+        int64_t time;
+        int32_t duration;
+    } kPieces[] = {{0, 0, 5292, 1000, 300000},
+                   {0, 5292, 5292, 301000, 300000},
+                   {0, 10584, 3528, 601000, 200000},
+                   {1, 0, 240, 0, 300000},
+                   {1, 240, 160, 300000, 200000},
+                   {2, 0, 399, 900000, 498750},
+                   {3, 0, 0, 5, 0},
+                   {4, 0, 1, -20, 1250},
+                   {5, 0, 240, 0, 300000}};
+    get_small_frame(nullptr);
+    for (const auto& [block, offset, length, time, duration] : kPieces) {
+        SCOPED_TRACE(testing::Message() << "block " << block << " from " << offset);
+        const AudioFrame* frame = get_small_frame(&decoder);
+        ASSERT_NE(frame, nullptr);
+        AudioFrame expected = decoder.blocks[block];
+        expected.pData += offset;
+        expected.nLength = expected.nBufferSize = length;
+        expected.llTime2 = expected.llTime = time;
+        expected.nDuration = duration;
+        EXPECT_TRUE(SameBytes(*frame, expected));
+    }
+    EXPECT_EQ(get_small_frame(nullptr), nullptr); // forgets the rest
+    EXPECT_EQ(get_small_frame(&decoder), nullptr);
+    EXPECT_EQ(get_small_frame(&decoder), nullptr);
 }
 
 TEST(StereoTest, WidensAndDoubles) {

@@ -5,7 +5,6 @@
 
 #include <climits>
 #include <cmath>
-#include <cwchar>
 #include <utility>
 
 namespace {
@@ -61,7 +60,7 @@ TEST_F(ParamTest, ZerosAreCompletedAndLoggedAsTheyCame) {
                                0, 44100, 6, 8,   0,   64000, 0,                                // sound
                                0, 0,     0};
     EXPECT_TRUE(SameBytes(Set(param), expected));
-    EXPECT_EQ(LogLines(),
+    EXPECT_EQ(Trace(Part::kLog),
               "log Halvane::SetEncodeParam: Flie format[], Video[] (0x0) 0.000000fps, 0bps 0 0bps "
               "Resize:0\\t\\tAudio[]0channels 0Hz , 0bps 0 0bps\n"
               "log Halvane::Source Video Info: (640x480) 29.970000fps, 12.500000 seconds.\n"
@@ -70,7 +69,8 @@ TEST_F(ParamTest, ZerosAreCompletedAndLoggedAsTheyCame) {
     recorder::Reset();
     EXPECT_EQ(MCSetEncodeParam(host.handle, nullptr), 1); // completes what is set
     EXPECT_EQ(Get().nWidth, 640);
-    EXPECT_NE(LogLines().find("Flie format[], Video[] (640x480)"), std::string::npos) << LogLines();
+    EXPECT_NE(Trace(Part::kLog).find("Flie format[], Video[] (640x480)"), std::string::npos)
+        << Trace(Part::kLog);
 }
 
 TEST_F(ParamTest, LogsEveryValueInItsPlace) {
@@ -81,7 +81,7 @@ TEST_F(ParamTest, LogsEveryValueInItsPlace) {
         FourCC("H264"), 0, 0, 1, -2, 250.0, 5, 4, 6, 7, {}, FourCC("MP3 "), 9, 8, 0, 11, 10, 12, 0, 0,
         FourCC("AVI ")};
     EXPECT_TRUE(SameBytes(Set(param), param)) << "there is nothing to complete it from";
-    EXPECT_EQ(LogLines(),
+    EXPECT_EQ(Trace(Part::kLog),
               "log Halvane::SetEncodeParam: Flie format[AVI ], Video[H264] (1x-2) 250.000000fps, 4bps 5 6bps "
               "Resize:7\\t\\tAudio[MP3 ]8channels 9Hz , 10bps 11 12bps\n");
 }
@@ -237,11 +237,11 @@ TEST(ClipTest, NamesAreNeverCut) {
         SCOPED_TRACE(testing::Message() << output.size() << " characters");
         ScriptedHost host;
         EXPECT_EQ(ClipNames(host, output, kAll).size(), clips);
-        const std::string trace = TraceWithoutLog();
+        const std::string trace = Trace(Part::kWithoutLog);
         EXPECT_EQ(trace.find("event finished 3\nfinished 3 without record\n") != std::string::npos,
                   clips < kAll);
         EXPECT_EQ(trace.find("close #0 with callback and context\n") != std::string::npos, clips == 100);
-        EXPECT_EQ(LogLines().find("output name too long") != std::string::npos, clips < kAll);
+        EXPECT_EQ(Trace(Part::kLog).find("output name too long") != std::string::npos, clips < kAll);
     }
 }
 

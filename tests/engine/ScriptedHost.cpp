@@ -34,15 +34,6 @@ std::string Describe(const ProgressInfo* info) {
     return text;
 }
 
-/// The lines of the trace that the log sink wrote, or the others, or both.
-std::string Lines(bool ofLog, bool others) {
-    std::string lines;
-    for (const std::string& line : recorder::Recorded().trace)
-        if (line.rfind("log ", 0) == 0 ? ofLog : others)
-            lines += line + "\n";
-    return lines;
-}
-
 /// Stamps of `count` records from 0 on, `step` apart.
 std::vector<int64_t> Stamps(int64_t step, size_t count) {
     std::vector<int64_t> stamps(count);
@@ -182,7 +173,7 @@ std::string ScriptedHost::Convert(double begin, double length) {
     if (const int result = Start(begin, length); result != 0)
         Note(Line("start -> %d", result));
     MCWait(handle, MC_INFINITE);
-    return TraceWithoutLog();
+    return Trace(Part::kWithoutLog);
 }
 
 unsigned ScriptedHost::Callback(void* context, unsigned kind, unsigned value, uintptr_t pointer) {
@@ -200,12 +191,10 @@ unsigned ScriptedHost::Callback(void* context, unsigned kind, unsigned value, ui
     return kind == 0 && host.records.size() == host.cancelAt ? 0 : 1;
 }
 
-std::string LogLines() {
-    return Lines(true, false);
-}
-std::string TraceWithoutLog() {
-    return Lines(false, true);
-}
-std::string WholeTrace() {
-    return Lines(true, true);
+std::string Trace(Part part) {
+    std::string lines;
+    for (const std::string& line : recorder::Recorded().trace)
+        if (part == Part::kWhole || (part == Part::kLog) == (line.rfind("log ", 0) == 0))
+            lines += line + "\n";
+    return lines;
 }

@@ -140,9 +140,8 @@ public:
     std::vector<ProgressInfo> records; // of the progress calls
 };
 
-/// The log lines of the trace, everything else, or all of it, a line each.
-std::string LogLines();
-std::string TraceWithoutLog();
-std::string WholeTrace();
+/// What has been noted, a line each.
+enum class Part { kLog, kWithoutLog, kWhole };
+std::string Trace(Part part);
 
 #endif

@@ -130,7 +130,7 @@ TEST_P(TraceTest, HappensInOrder) {
     }
     const std::string expected{std::istreambuf_iterator<char>(file), {}};
     const std::string trace = script.host.Convert(script.begin, script.length);
-    EXPECT_EQ(expected.rfind("log ", 0) == 0 ? WholeTrace() : trace, expected);
+    EXPECT_EQ(expected.rfind("log ", 0) == 0 ? Trace(Part::kWhole) : trace, expected);
 }
 
 INSTANTIATE_TEST_SUITE_P(Traces, TraceTest, testing::ValuesIn(Traces()), [](const auto& info) {
