@@ -2,6 +2,7 @@
 
 #include "tests/log/ScriptedBundle.h"
 #include "tests/support/Folder.h"
+#include "tests/support/Process.h"
 
 #include <gtest/gtest.h>
 
@@ -13,9 +14,6 @@
 #include <thread>
 #include <vector>
 
-#include <sys/wait.h>
-#include <unistd.h>
-
 // What a search of the whole process would find; the log module must never call it.
 extern "C" [[gnu::visibility("default")]] int GlobalLog(const wchar_t*) __asm__("Log");
 extern "C" int GlobalLog(const wchar_t* /*text*/) {
@@ -26,21 +24,15 @@ namespace {
 
 namespace fs = std::filesystem;
 
-/// Runs `body` in a process of its own, where nothing has been logged yet, and gives back what that printed.
-/// Failed expectations in the body count here.
+/// What `body` prints in a process of its own, where nothing has been logged yet. Failed expectations in it
+/// count here.
 std::string PrintedBy(const std::function<void()>& body) {
-    testing::internal::CaptureStdout();
-    const pid_t child = fork();
-    if (child == 0) {
+    const ProcessResult child = InChild([&] {
         body();
-        std::fflush(nullptr);
-        _exit(testing::Test::HasFailure() ? 1 : 0);
-    }
-    int status = -1;
-    waitpid(child, &status, 0);
-    std::string printed = testing::internal::GetCapturedStdout();
-    EXPECT_EQ(status, 0) << printed;
-    return printed;
+        return testing::Test::HasFailure();
+    });
+    EXPECT_EQ(child.code, 0) << child.out << child.err;
+    return child.out;
 }
 
 class Logging : public testing::Test {
@@ -86,6 +78,7 @@ TEST_F(Logging, DirectoryTable) {
     const std::string localhost = "file://localhost";
     struct {
         std::string url, path;
+        Missing missing = Missing::Nothing;
     } const cases[] = {
         {"file://localhost/Applications/My%20App.app/", "/Applications/My App.app/Contents/MacOS"},
         {"file://localhost/usr/local/bin/", "/usr/local/bin"},
@@ -101,9 +94,13 @@ TEST_F(Logging, DirectoryTable) {
         {localhost + "/" + std::string(493, 'd') + "/", ""}, // 511 bytes: too long for the URL's buffer
         {std::string(491, 'd') + ".app/", std::string(491, 'd') + ".app/Contents/MacOS"},
         {std::string(492, 'd') + ".app/", ""},
+        {"file:///Applications/X.app/", "", Missing::Bundle},
+        {"file:///Applications/X.app/", "", Missing::Url},
+        {"file:///Applications/X.app/", "", Missing::String},
     };
-    for (const auto& [url, path] : cases) {
+    for (const auto& [url, path, missing] : cases) {
         g_bundle.url = url;
+        g_bundle.missing = missing;
         std::string buffer(512, '#');
         GetAppPathA(buffer.data(), 511);
         EXPECT_EQ(buffer.c_str(), path) << url;
@@ -111,15 +108,6 @@ TEST_F(Logging, DirectoryTable) {
         for (const int none : {0, -1})
             GetAppPathA(buffer.data() + 511, none);
         EXPECT_EQ(buffer[511], '#');
-    }
-}
-
-TEST_F(Logging, DirectoryIsEmptyWithoutABundle) {
-    for (const Missing missing : {Missing::Bundle, Missing::Url, Missing::String}) {
-        g_bundle.missing = missing;
-        char buffer[32] = "before";
-        GetAppPathA(buffer, sizeof buffer);
-        EXPECT_STREQ(buffer, "");
     }
 }
 

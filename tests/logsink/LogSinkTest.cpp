@@ -5,7 +5,6 @@
 
 #include <algorithm>
 #include <clocale>
-#include <cwchar>
 #include <fstream>
 #include <set>
 #include <string>
