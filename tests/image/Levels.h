@@ -19,21 +19,15 @@ extern const RowKernels kEmulatedAvx512Kernels;
 }
 #endif
 
-/// The kernels of a level, emulated where the machine lacks it and an emulation was built.
-inline const image::RowKernels* TestedKernels(image::KernelLevel level) {
-    const image::RowKernels* kernels = image::RowKernelsFor(level);
-#ifdef MOVIECONV_EMULATED_AVX512
-    if (kernels == nullptr && level == image::KernelLevel::kAvx512)
-        return &image::kEmulatedAvx512Kernels;
-#endif
-    return kernels;
-}
-
-/// Skips a level that can't be run.
+/// Skips a level that the machine lacks, unless an emulation was built.
 class LevelTest : public testing::TestWithParam<image::KernelLevel> {
 protected:
     void SetUp() override {
-        kernels = TestedKernels(GetParam());
+        kernels = image::RowKernelsFor(GetParam());
+#ifdef MOVIECONV_EMULATED_AVX512
+        if (kernels == nullptr && GetParam() == image::KernelLevel::kAvx512)
+            kernels = &image::kEmulatedAvx512Kernels;
+#endif
         if (kernels == nullptr)
             GTEST_SKIP() << "this machine lacks the level";
     }

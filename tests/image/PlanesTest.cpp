@@ -31,8 +31,8 @@ TEST(YUV444_2_420, AveragesTheSamplesThatExist) {
 
 TEST(YUV420_2_444, DoublesEverySample) {
     for (const PictureSize size : PictureSizes()) {
-        for (const bool ex :
-             {false, true}) { // which takes the target's size, and leaves an odd last column and row
+        // Ex takes the target's size, and leaves an odd last column and row.
+        for (const bool ex : {false, true}) {
             const PictureSize target = ex ? size : PictureSize{2 * size.width, 2 * size.height};
             const int sourceWidth = (target.width + 1) / 2;
             TestRows from(sourceWidth, (target.height + 1) / 2, sourceWidth);

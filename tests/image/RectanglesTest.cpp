@@ -202,19 +202,4 @@ TEST(Rectangles, OfSizeZeroOrLessAreLeftAlone) {
     bitmap.Check("bitmap");
 }
 
-TEST(Rectangles, KnownGroups) {
-    unsigned char redBlue[]{0, 0, 255, 255, 0, 0};
-    unsigned char group[4];
-    Rgb24_2_YUY2(group, 4, 0, 0, 2, 1, 1, redBlue, 1, 6, 0, 0);
-    EXPECT_TRUE(group[0] == 81 && group[1] == 164 && group[2] == 40 && group[3] == 174);
-    Rgb24_2_YUY2(group, 4, 0, 0, 1, 1, 0, redBlue, 1, 6, 0, 0);
-    EXPECT_TRUE(group[0] == 90 && group[1] == 81 && group[2] == 239 && group[3] == 81);
-
-    unsigned char uyvy[]{235, 128, 16, 128};
-    unsigned char pixels[6];
-    YUY2_2_Rgb24(pixels, 1, 6, 0, 0, 2, 1, uyvy, 4, 0, 0, 0);
-    EXPECT_TRUE(pixels[0] == 255 && pixels[1] == 179 && pixels[2] == 0);
-    EXPECT_TRUE(pixels[3] == 255 && pixels[4] == 179 && pixels[5] == 0);
-}
-
 } // namespace

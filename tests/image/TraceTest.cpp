@@ -5,7 +5,6 @@
 
 #include <csignal>
 #include <cstring>
-#include <functional>
 #include <limits>
 #include <utility>
 
