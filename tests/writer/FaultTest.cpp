@@ -14,7 +14,6 @@
 #include <filesystem>
 #include <memory>
 #include <string>
-#include <thread>
 #include <utility>
 #include <vector>
 
@@ -73,12 +72,6 @@ private:
     Faults& faults_;
 };
 
-struct Outcome {
-    bool created = false;
-    bool complete = false;
-    WriterStatus status{};
-};
-
 class Fault : public testing::Test {
 protected:
     Fault() {
@@ -93,33 +86,34 @@ protected:
     }
     ~Fault() override { MWSetWriterOptions(nullptr); }
 
-    Outcome Run() {
+    /// Writes the movie and gives the last status of the file.
+    WriterStatus Run() {
         MWSetWriterOptions(&options_);
         events_.clear();
+        created_ = false;
         faults_.writes = 0;
         FaultyFiles files(faults_);
         const VideoFormat video = movie_.Video();
         const AudioFormat audio = movie_.Audio();
         const auto record = writer::StatusBoard::Instance().Open(path_);
-        Outcome outcome;
         try {
             auto file =
                 std::make_unique<writer::MediaFile>(path_, movie_.param, &video, &audio, record, files);
-            outcome.created = true;
+            created_ = true;
             movie_.WriteAll(file.get());
-            outcome.complete = file->Close();
+            const bool complete = file->Close();
+            EXPECT_EQ(complete, record->Snapshot().nState == kWriterFileComplete);
         } catch (const writer::WriterFailure& failure) {
             record->Fail(failure);
         }
-        outcome.status = record->Snapshot();
-        return outcome;
+        return record->Snapshot();
     }
 
-    static void ExpectPlayablePart(const Outcome& outcome) {
-        const std::string part = outcome.status.szTemporaryPath;
+    static void ExpectPlayablePart(const WriterStatus& status) {
+        const std::string part = status.szTemporaryPath;
         ASSERT_FALSE(part.empty());
         const ReadMovie read = ReadMovieFile(part);
-        if (outcome.status.llBytesWritten < 100'000 && read.pictures.empty())
+        if (status.llBytesWritten < 100'000 && read.pictures.empty())
             return; // Not even the first fragment was whole.
         EXPECT_TRUE(read.readable);
         EXPECT_GT(read.pictures.size(), 10U);
@@ -132,6 +126,7 @@ protected:
     Faults faults_;
     WriterOptions options_{};
     std::vector<int> events_;
+    bool created_ = false;
     int asked_ = 0; ///< For more room.
 };
 
@@ -146,7 +141,7 @@ class FaultIn : public Fault, public testing::WithParamInterface<Disk> {};
 TEST_P(FaultIn, EveryWriteIsToldAndLeavesAPlayablePart) {
     movie_.param.fccFileFormat = GetParam().format;
     movie_.param.fccAudio = FourCC("MP3 ");
-    ASSERT_TRUE(Run().complete);
+    ASSERT_EQ(Run().nState, kWriterFileComplete);
     const int writes = faults_.writes;
     ASSERT_GT(writes, 1);
     faults_.writeError = GetParam().error;
@@ -154,24 +149,22 @@ TEST_P(FaultIn, EveryWriteIsToldAndLeavesAPlayablePart) {
         SCOPED_TRACE("write " + std::to_string(number));
         WriteFile(path_, "earlier");
         faults_.failingWrite = number;
-        const Outcome outcome = Run();
-        if (outcome.complete) {
+        const WriterStatus status = Run();
+        if (status.nState == kWriterFileComplete) {
             // The data was whole in the temporary file, only its tidier form found no room.
             EXPECT_EQ(ReadMovieFile(path_).pictures.size(), 100U);
             EXPECT_EQ(folder_.Names(), std::vector<std::string>{"movie"});
             continue;
         }
         EXPECT_EQ(ReadFile(path_), "earlier");
-        EXPECT_EQ(outcome.status.nError,
-                  GetParam().error == ENOSPC ? kWriterErrorNoSpace : kWriterErrorWrite);
-        EXPECT_EQ(outcome.status.nSystemError, GetParam().error);
-        EXPECT_NE(std::string(outcome.status.szWhat).find(std::strerror(GetParam().error)),
-                  std::string::npos);
-        if (outcome.created) {
-            EXPECT_EQ(outcome.status.nState, kWriterFileFailed);
+        EXPECT_EQ(status.nError, GetParam().error == ENOSPC ? kWriterErrorNoSpace : kWriterErrorWrite);
+        EXPECT_EQ(status.nSystemError, GetParam().error);
+        EXPECT_NE(std::string(status.szWhat).find(std::strerror(GetParam().error)), std::string::npos);
+        if (created_) {
+            EXPECT_EQ(status.nState, kWriterFileFailed);
             EXPECT_EQ(events_, (std::vector<int>{kWriterEventFailed, kWriterEventClosed}));
-            ExpectPlayablePart(outcome);
-            std::filesystem::remove(outcome.status.szTemporaryPath);
+            ExpectPlayablePart(status);
+            std::filesystem::remove(status.szTemporaryPath);
         }
         EXPECT_EQ(folder_.Names(), std::vector<std::string>{"movie"});
     }
@@ -189,23 +182,23 @@ TEST_F(Fault, SyncAndRenameKeepTheDataUnderItsTemporaryName) {
     for (int Faults::*where : {&Faults::syncError, &Faults::renameError}) {
         faults_.syncError = faults_.renameError = 0;
         faults_.*where = EIO;
-        const Outcome outcome = Run();
-        EXPECT_FALSE(outcome.complete);
-        EXPECT_EQ(outcome.status.nError, kWriterErrorFinish);
-        EXPECT_EQ(outcome.status.nSystemError, EIO);
-        EXPECT_EQ(ReadMovieFile(outcome.status.szTemporaryPath).pictures.size(), 100U);
+        const WriterStatus status = Run();
+        EXPECT_EQ(status.nState, kWriterFileFailed);
+        EXPECT_EQ(status.nError, kWriterErrorFinish);
+        EXPECT_EQ(status.nSystemError, EIO);
+        EXPECT_EQ(ReadMovieFile(status.szTemporaryPath).pictures.size(), 100U);
         EXPECT_FALSE(std::filesystem::exists(path_));
         EXPECT_EQ(folder_.Names().size(), 1U);
-        std::filesystem::remove(outcome.status.szTemporaryPath);
+        std::filesystem::remove(status.szTemporaryPath);
     }
 }
 
 TEST_F(Fault, APartialFileIsRemovedWhenTheHostWantsThat) {
     options_.bRemovePartial = 1;
     faults_.failingWrite = 3;
-    const Outcome outcome = Run();
-    EXPECT_FALSE(outcome.complete);
-    EXPECT_EQ(std::string(outcome.status.szTemporaryPath), "");
+    const WriterStatus status = Run();
+    EXPECT_EQ(status.nState, kWriterFileFailed);
+    EXPECT_EQ(std::string(status.szTemporaryPath), "");
     EXPECT_TRUE(folder_.Names().empty());
 }
 
@@ -218,7 +211,7 @@ TEST_F(Fault, AFullDiskCanBeWaitedFor) {
             self->faults_.failingWrite = -1; // There is room again.
         return 1;
     };
-    EXPECT_TRUE(Run().complete);
+    EXPECT_EQ(Run().nState, kWriterFileComplete);
     EXPECT_EQ(asked_, 3);
     EXPECT_EQ(ReadMovieFile(path_).pictures.size(), 100U);
 }

@@ -9,7 +9,6 @@ extern "C" {
 
 #include <algorithm>
 #include <cmath>
-#include <cstring>
 #include <map>
 
 namespace {
@@ -28,38 +27,18 @@ void TakePicture(const AVFrame& frame, AVRational unit, ReadMovie& movie) {
     movie.pictures.push_back(std::move(picture));
 }
 
-template <class Sample>
-float Load(const uint8_t* data) {
-    Sample sample;
-    std::memcpy(&sample, data, sizeof sample);
-    return static_cast<float>(sample);
-}
-
-/// A sample of the first channel.
-float SampleAt(const AVFrame& frame, int index) {
-    const auto format = static_cast<AVSampleFormat>(frame.format);
-    const int step = av_sample_fmt_is_planar(format) != 0 ? 1 : frame.ch_layout.nb_channels;
-    const uint8_t* data = frame.data[0] + ptrdiff_t{index} * step * av_get_bytes_per_sample(format);
-    switch (av_get_packed_sample_fmt(format)) {
-    case AV_SAMPLE_FMT_U8:
-        return Load<uint8_t>(data) / 128.0F - 1.0F;
-    case AV_SAMPLE_FMT_S16:
-        return Load<int16_t>(data) / 32768.0F;
-    case AV_SAMPLE_FMT_S32:
-        return Load<int32_t>(data) / 2147483648.0F;
-    case AV_SAMPLE_FMT_FLT:
-        return Load<float>(data);
-    default:
-        return 0;
-    }
-}
-
 void TakeSound(const AVFrame& frame, AVRational unit, ReadMovie& movie) {
     if (movie.samples == 0)
         movie.audioStart = static_cast<double>(frame.best_effort_timestamp) * av_q2d(unit);
-    for (int i = 0; i < frame.nb_samples; ++i)
-        movie.firstChannel.push_back(SampleAt(frame, i));
     movie.samples += frame.nb_samples;
+    const av::Resampler toFloat(swr_alloc());
+    const av::Frame floats(av_frame_alloc());
+    floats->format = AV_SAMPLE_FMT_FLTP;
+    floats->sample_rate = frame.sample_rate;
+    av_channel_layout_copy(&floats->ch_layout, &frame.ch_layout);
+    ASSERT_EQ(swr_convert_frame(toFloat.get(), floats.get(), &frame), 0);
+    const auto* first = reinterpret_cast<const float*>(floats->data[0]);
+    movie.firstChannel.insert(movie.firstChannel.end(), first, first + floats->nb_samples);
 }
 
 av::CodecContext OpenDecoder(const AVStream& stream) {

@@ -5,7 +5,6 @@
 #include <gtest/gtest.h>
 
 #include <cmath>
-#include <string>
 #include <vector>
 
 namespace {
@@ -30,41 +29,30 @@ Tone Heard(const ReadMovie& movie) {
     return {crossings * movie.sampleRate / samples, std::sqrt(squares / samples)};
 }
 
-struct Pcm {
-    int rate;
-    int channels;
-    int bits;
-};
-
-class SoundFormats : public testing::TestWithParam<Pcm> {};
-
-TEST_P(SoundFormats, AreHeardAsTheyWere) {
-    TestMovie movie;
-    movie.hasVideo = false;
-    movie.sampleRate = GetParam().rate;
-    movie.channels = GetParam().channels;
-    movie.bits = GetParam().bits;
-    movie.param.fccFileFormat = FourCC("M4A ");
-    const ReadMovie read = WriteAndRead(movie);
-    EXPECT_TRUE(read.readable);
-    EXPECT_GE(read.sampleRate, std::min(GetParam().rate, 96000));
-    EXPECT_LE(read.channels, GetParam().channels);
-    EXPECT_NEAR(Heard(read).frequency, 440.0, 3.0);
-    EXPECT_NEAR(Heard(read).loudness, 0.5 / M_SQRT2, 0.03);
-    EXPECT_NEAR(Latest().dAudioWritten, 2.0, 0.0002);
-    EXPECT_LE(static_cast<double>(read.samples), 2.0 * read.sampleRate + 1024);
+TEST(Sound, OfAnyFormatIsHeardAsItWas) {
+    constexpr struct {
+        int rate, channels, bits;
+    } kFormats[] = {{44100, 2, 16}, {8000, 1, 8},   {22050, 1, 16},  {48000, 6, 16},
+                    {37800, 2, 16}, {96000, 2, 24}, {192000, 2, 32}, {44100, 1, 32},
+                    {11025, 4, 8},  {48000, 8, 24}, {44100, 11, 16}};
+    for (const auto& [rate, channels, bits] : kFormats) {
+        SCOPED_TRACE(testing::Message() << rate << " Hz, " << channels << " x " << bits);
+        TestMovie movie;
+        movie.hasVideo = false;
+        movie.sampleRate = rate;
+        movie.channels = channels;
+        movie.bits = bits;
+        movie.param.fccFileFormat = FourCC("M4A ");
+        const ReadMovie read = WriteAndRead(movie);
+        EXPECT_TRUE(read.readable);
+        EXPECT_GE(read.sampleRate, std::min(rate, 96000));
+        EXPECT_LE(read.channels, channels);
+        EXPECT_NEAR(Heard(read).frequency, 440.0, 3.0);
+        EXPECT_NEAR(Heard(read).loudness, 0.5 / M_SQRT2, 0.03);
+        EXPECT_NEAR(Latest().dAudioWritten, 2.0, 0.0002);
+        EXPECT_LE(static_cast<double>(read.samples), 2.0 * read.sampleRate + 1024);
+    }
 }
-
-INSTANTIATE_TEST_SUITE_P(All, SoundFormats,
-                         testing::Values(Pcm{44100, 2, 16}, Pcm{8000, 1, 8}, Pcm{22050, 1, 16},
-                                         Pcm{48000, 6, 16}, Pcm{37800, 2, 16}, Pcm{96000, 2, 24},
-                                         Pcm{192000, 2, 32}, Pcm{44100, 1, 32}, Pcm{11025, 4, 8},
-                                         Pcm{48000, 8, 24}, Pcm{44100, 11, 16}),
-                         [](const auto& info) {
-                             return std::to_string(info.param.rate) + "Hz" +
-                                    std::to_string(info.param.channels) + "x" +
-                                    std::to_string(info.param.bits);
-                         });
 
 /// Uncompressed sound alone.
 TestMovie PcmMovie() {
