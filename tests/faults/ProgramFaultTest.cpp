@@ -1,6 +1,5 @@
 // What befalls a conversion from outside: the input is cut or removed, the output's folder goes, threads
-// cannot be started, the log cannot be written. The program tells it by its exit code and leaves no half file
-// under a real name.
+// cannot be started. The program tells it by its exit code and leaves no half file under a real name.
 #include "tests/faults/CrashReport.h"
 #include "tests/host/Inspect.h"
 #include "tests/host/Program.h"
@@ -92,14 +91,6 @@ TEST(OutputFault, ALimitOfTheFileSizeIsTold) {
     EXPECT_EQ(result.code, 4) << result.err;
     EXPECT_NE(result.err.find("File too large; what was"), std::string::npos) << result.err;
     EXPECT_GT(LookAt(folder / "out.mp4.part").pictures.size(), 25u);
-}
-
-TEST(LogFault, AFullPlaceForTheLogIsNoHarm) {
-    const Folder folder;
-    const std::string source = Make("short.mkv", Join(CountedPictures(1), Beeps(1), Args{"-c:v", "mpeg4"}));
-    const Result full = Call({source, folder / "out.mp4", "--log", "/dev/full"});
-    EXPECT_EQ(full.code, 0) << full.err;
-    EXPECT_EQ(LookAt(folder / "out.mp4").pictures.size(), 25u);
 }
 
 // A source that delivers nothing for a while, and then goes on.

@@ -15,40 +15,36 @@ using host::StampRepair;
 constexpr int64_t kStep = 400'000;
 constexpr std::optional<int64_t> kNone;
 
-std::vector<int64_t> Repair(const std::vector<std::optional<int64_t>>& stamps, int expectedRepairs) {
-    StampRepair repair(kStep);
-    std::vector<int64_t> times;
-    for (const auto& stamp : stamps)
-        if (const auto settled = repair.Push(stamp))
-            times.push_back(settled->time);
-    if (const auto last = repair.Finish())
-        times.push_back(last->time);
-    EXPECT_EQ(repair.Repaired(), expectedRepairs);
-    return times;
-}
-
-using Times = std::vector<int64_t>;
-
-TEST(StampRepair, LeavesRisingStampsAlone) {
-    EXPECT_EQ(Repair({}, 0), Times{});
-    EXPECT_EQ(Repair({70}, 0), Times{70});
-    EXPECT_EQ(Repair({-5, 3, 4, 900'000'000}, 0), (Times{-5, 3, 4, 900'000'000}));
-}
-
-TEST(StampRepair, PutsAMissingStampOneStepOnOrBetweenItsNeighbours) {
-    EXPECT_EQ(Repair({0, kNone, kNone}, 2), (Times{0, kStep, 2 * kStep}));
-    EXPECT_EQ(Repair({0, kNone, 2 * kStep}, 1), (Times{0, kStep, 2 * kStep}));
-    EXPECT_EQ(Repair({0, kNone, 100}, 1), (Times{0, 50, 100}));
-    EXPECT_EQ(Repair({kNone, kStep * 3}, 1), (Times{kStep * 2, kStep * 3}));
-}
-
-TEST(StampRepair, LiftsEqualAndFallingStamps) {
-    EXPECT_EQ(Repair({0, 0, 2 * kStep}, 1), (Times{0, kStep, 2 * kStep}));
-    EXPECT_EQ(Repair({5 * kStep, kStep, 2 * kStep}, 2), (Times{5 * kStep, 6 * kStep, 7 * kStep}));
-}
-
-TEST(StampRepair, PassesOverASingleWildStamp) {
-    EXPECT_EQ(Repair({0, 900'000'000, 2 * kStep, 3 * kStep}, 1), (Times{0, kStep, 2 * kStep, 3 * kStep}));
+TEST(StampRepair, KeepsRisingStampsAndMendsTheOthers) {
+    const struct {
+        std::vector<std::optional<int64_t>> stamps;
+        int repairs;
+        std::vector<int64_t> times;
+    } cases[] = {
+        {{}, 0, {}},
+        {{70}, 0, {70}},
+        {{-5, 3, 4, 900'000'000}, 0, {-5, 3, 4, 900'000'000}},
+        // A missing stamp is one step on, or between its neighbours.
+        {{0, kNone, kNone}, 2, {0, kStep, 2 * kStep}},
+        {{0, kNone, 2 * kStep}, 1, {0, kStep, 2 * kStep}},
+        {{0, kNone, 100}, 1, {0, 50, 100}},
+        {{kNone, kStep * 3}, 1, {kStep * 2, kStep * 3}},
+        // Equal and falling ones are lifted, and a single wild one is passed over.
+        {{0, 0, 2 * kStep}, 1, {0, kStep, 2 * kStep}},
+        {{5 * kStep, kStep, 2 * kStep}, 2, {5 * kStep, 6 * kStep, 7 * kStep}},
+        {{0, 900'000'000, 2 * kStep, 3 * kStep}, 1, {0, kStep, 2 * kStep, 3 * kStep}},
+    };
+    for (const auto& test : cases) {
+        StampRepair repair(kStep);
+        std::vector<int64_t> times;
+        for (const auto& stamp : test.stamps)
+            if (const auto settled = repair.Push(stamp))
+                times.push_back(settled->time);
+        if (const auto last = repair.Finish())
+            times.push_back(last->time);
+        EXPECT_EQ(times, test.times) << &test - cases;
+        EXPECT_EQ(repair.Repaired(), test.repairs) << &test - cases;
+    }
 }
 
 TEST(StampRepair, GivesTheDistanceToTheNextPictureAsDuration) {
