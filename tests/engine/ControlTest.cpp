@@ -151,14 +151,4 @@ TEST(DispatchTest, ChoosesTheLoopByTheStreams) {
     }
 }
 
-// The one failure that comes without an event.
-TEST(DispatchTest, TellsOfMissingPicturesByTheCallbackAlone) {
-    ScriptedHost host;
-    host.SetMovie(1, 0);
-    host.video.descriptions = 5; // all but the loop's own
-    EXPECT_EQ(host.Convert(), "finished 3 without record\n");
-    EXPECT_NE(Trace(Part::kLog).find("log MovieConv::Without video decoder.\nlog Encoding thread Exit.\n"),
-              std::string::npos);
-}
-
 } // namespace
