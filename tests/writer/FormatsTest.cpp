@@ -36,6 +36,12 @@ std::vector<Pair> AllPairs() {
     return pairs;
 }
 
+std::vector<Pair> PicturePairs() {
+    std::vector<Pair> pairs = AllPairs();
+    std::erase_if(pairs, [](const Pair& pair) { return pair.video == 0; });
+    return pairs;
+}
+
 class Formats : public testing::TestWithParam<Pair> {
 protected:
     Formats() {
@@ -50,6 +56,8 @@ protected:
 
     TestMovie movie_;
 };
+
+class PictureFormats : public Formats {};
 
 TEST_P(Formats, AreReadBackComplete) {
     const ReadMovie read = WriteAndRead(movie_);
@@ -82,16 +90,15 @@ TEST_P(Formats, AreReadBackComplete) {
 }
 
 // A source can announce sound and have none.
-TEST_P(Formats, KeepPicturesWithoutSound) {
+TEST_P(PictureFormats, KeepPicturesWithoutSound) {
     movie_.pictures = 5;
     movie_.soundSeconds = 0;
-    if (!movie_.hasVideo)
-        GTEST_SKIP() << "carries no pictures";
     const ReadMovie read = WriteAndRead(movie_);
     EXPECT_TRUE(read.readable);
     EXPECT_EQ(read.pictures.size(), 5U);
 }
 
 INSTANTIATE_TEST_SUITE_P(All, Formats, testing::ValuesIn(AllPairs()), Name);
+INSTANTIATE_TEST_SUITE_P(All, PictureFormats, testing::ValuesIn(PicturePairs()), Name);
 
 } // namespace
