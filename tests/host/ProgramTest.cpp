@@ -190,6 +190,7 @@ TEST(Program, RefusesAndLeavesEverythingAsItWas) {
         {{source, folder / "out.mkv", "--preview", folder / "same.mkv"}, 2, "is the source"},
         {{source, folder / "out.mkv", "--log", folder / "out.mkv.part"}, 2, "is the output"},
         {{source, folder / "clip.mkv", "--split", "1", "--log", folder / "clip_100.mkv"}, 2, "is the output"},
+        {{source, folder / "out.mkv", "--log", folder / "x", "--preview", folder / "x"}, 2, "the same file"},
         {{source, folder / "link.mkv", "-y"}, 4, "a link to a missing file"},
         {{source, folder / "there.mp4"}, 4, "--overwrite"},
         {{source, folder / "clip.mp4", "--split", "1"}, 4, "clip_03.mp4"},
@@ -292,6 +293,21 @@ TEST(Program, TellsAboutSourcesFormatsAndRoom) {
     EXPECT_NE(Call({"--list-formats"}).out.find("MKV"), std::string::npos);
     EXPECT_NE(Call({"--help"}).out.find("--split"), std::string::npos);
     EXPECT_NE(Call({"--version"}).out.find("movieconv 1."), std::string::npos);
+}
+
+TEST(Program, GetsAlongWithWhateverStandardStreams) {
+    const Folder folder;
+    const std::string raw = Make("raw.mpv", Join(CountedPictures(1), Args{"-f", "mpeg2video"}));
+    const auto shell = [&](const std::string& command) {
+        return program::Run({"sh", "-c", "movieconv() { '" MOVIECONV_PROGRAM "' \"$@\"; }; " + command, raw,
+                             folder / "out.mp4"});
+    };
+    EXPECT_EQ(shell("movieconv \"$0\" \"$1\" <&- >&- 2>&-").code, 0);
+    EXPECT_EQ(LookAt(folder / "out.mp4").pictures.size(), 25u);
+    EXPECT_EQ(shell("movieconv --list-formats >/dev/full").code, 4);
+    EXPECT_NE(shell("cat \"$0\" | movieconv --info /dev/stdin").out.find("length unknown"),
+              std::string::npos);
+    EXPECT_EQ(shell("cat \"$0\" | movieconv --estimate /dev/stdin \"$1\"").code, 2);
 }
 
 std::string Minute() {
