@@ -3,6 +3,7 @@
 #include "fuzz/Fuzz.h"
 #include "host/SoundTimeline.h"
 #include "host/StampRepair.h"
+#include "media/MediaRecords.h"
 
 #include <algorithm>
 #include <optional>
@@ -55,7 +56,7 @@ void FuzzSound(FuzzedDataProvider& input) {
         FUZZ_CHECK(placed.silence >= 0 && placed.cut >= 0 && placed.cut <= samples);
         FUZZ_CHECK(placed.silence == 0 || placed.cut == 0);
         FUZZ_CHECK(timeline.Position() == before + placed.silence + samples - placed.cut);
-        due += samples * 10'000'000 / rate;
+        due += samples * kTicksPerSecond / rate;
     }
 }
 

@@ -41,7 +41,7 @@ private:
     int signals_ = -1;
     int wake_ = -1;
     std::atomic<bool> armed_{false};
-    bool wantsKeys_ = false;
+    std::atomic<bool> wantsKeys_{false};
     std::atomic<bool> keys_{false};
     bool stopAsked_ = false; // the thread's
     std::thread thread_;

@@ -34,7 +34,7 @@ constexpr uint32_t kPcm = FourCC("PCM ");
 constexpr std::array kVideoCodecs{
     VideoCodec{kXvid,  AV_CODEC_ID_MPEG4,      "mpeg4",      false, false, false},
     VideoCodec{kH264,  AV_CODEC_ID_H264,       "libx264",    true,  false, true},
-    VideoCodec{kHevc,  AV_CODEC_ID_HEVC,       "libx265",    true,  false, true},
+    VideoCodec{kHevc,  AV_CODEC_ID_HEVC,       "libx265",    true,  false, false},
     VideoCodec{kMjpg,  AV_CODEC_ID_MJPEG,      "mjpeg",      false, true,  false},
     VideoCodec{kVp8,   AV_CODEC_ID_VP8,        "libvpx",     false, false, true},
     VideoCodec{kVp9,   AV_CODEC_ID_VP9,        "libvpx-vp9", false, false, true},
