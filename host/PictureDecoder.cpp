@@ -179,9 +179,10 @@ bool PictureDecoder::ConsiderMoreThreads(av::Packet packet) {
     return !runsEmpty || !leavesIdle || UseMoreThreads(known);
 }
 
-/// Begins again with more threads and skips the frames that are known, whatever lies between key pictures.
+/// Begins again with more threads, one more than processors since they wait for each other, and skips the
+/// frames that are known, whatever lies between key pictures.
 bool PictureDecoder::UseMoreThreads(const std::vector<av::Packet>& known) {
-    const unsigned threads = std::min(std::thread::hardware_concurrency(), kMostThreads);
+    const unsigned threads = std::min(std::thread::hardware_concurrency() + 1, kMostThreads);
     damagedBefore_ += decoder_->Damaged();
     decoder_ = std::make_unique<StreamDecoder>(*stream_, static_cast<int>(threads));
     skip_ = decoded_;

@@ -8,7 +8,8 @@ namespace host {
 namespace {
 
 constexpr int kBlocksPerSecond = 100;
-constexpr int kSmallestBlock = 16; // samples
+constexpr int kSmallestBlock = 16;          // samples
+constexpr std::size_t kQueuesPerSecond = 3; // the packets of pictures wait as long as sound is decoded ahead
 
 /// Samples in one block: 10 ms, and always less than half a picture, so that pictures and sound interleave
 /// finely.
@@ -45,7 +46,7 @@ SoundDecoder::SoundDecoder(const Source& source, Demuxer& demuxer)
       inputForm_(av::NewFrame()),
       queue_(1 << 12,
              static_cast<std::size_t>(source.Info().sound->sampleRate) *
-                 static_cast<std::size_t>(source.Info().sound->channels) * 4,
+                 static_cast<std::size_t>(source.Info().sound->channels) * 2 / kQueuesPerSecond,
              {L"Movie::The sound decoder waits for the conversion",
               L"Movie::The conversion waits for the sound decoder"}) {
     const SoundStreamInfo& sound = *source.Info().sound;
