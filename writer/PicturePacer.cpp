@@ -53,10 +53,11 @@ PicturePacer::Showing PicturePacer::Add(int64_t time) {
     if (!origin_)
         origin_ = time;
     if (keepStamps_) {
-        const Showing showing = ShowOnce();
-        pending_ = TickOf(time);
-        lastTick_ = pending_ ? pending_ : lastTick_;
-        return showing;
+        const std::optional<int64_t> tick = TickOf(time);
+        if (!tick)
+            return {};
+        lastTick_ = tick;
+        return {*tick, 1};
     }
     const int64_t index = GridIndex(time);
     const Showing showing = ShowUntil(index);
@@ -65,16 +66,10 @@ PicturePacer::Showing PicturePacer::Add(int64_t time) {
 }
 
 PicturePacer::Showing PicturePacer::Finish(int64_t end) {
-    if (keepStamps_)
-        return ShowOnce();
     // A file too short for the grid still shows a picture; otherwise one whose place is the end would only
     // make the file longer.
     const int64_t atLeast = lastTick_ ? 0 : pending_.value_or(0) + 1;
     return ShowUntil(std::max(GridIndex(end), atLeast));
-}
-
-PicturePacer::Showing PicturePacer::ShowOnce() {
-    return pending_ ? Showing{*pending_, 1} : Showing{};
 }
 
 /// Shows the pending picture from its place on the grid up to the place before `index`.

@@ -26,8 +26,7 @@ struct PictureClock {
 /// Ticks fine enough for single stamps, or whole pictures where the container knows nothing else.
 PictureClock MakePictureClock(AVRational rate, bool wholePictures);
 
-/// Turns the times of pictures into ticks. A picture's showing is known when the next one has come, so each
-/// call answers for the picture before. Not thread-safe.
+/// Turns the times of pictures into ticks. Not thread-safe.
 class PicturePacer {
 public:
     /// `keepStamps`: every picture is shown once at its own time, times that lie near the steady grid are put
@@ -35,30 +34,32 @@ public:
     /// filled exactly.
     PicturePacer(const PictureClock& clock, bool keepStamps);
 
+    /// Whether a picture's showing is known when it comes. On the grid it is when the next one has come.
+    bool AnswersAtOnce() const { return keepStamps_; }
+
     /// `count` showings, the first at `tick`, each a picture after the one before; 0: not shown at all.
     struct Showing {
         int64_t tick = 0;
         int64_t count = 0;
     };
 
-    /// A picture whose time in the file is `time`, in 100 ns units, rising. Returns the showing of the one
-    /// before.
+    /// A picture whose time in the file is `time`, in 100 ns units, rising. Returns its own showing if that
+    /// is answered at once, else that of the picture before.
     Showing Add(int64_t time);
 
-    /// Returns the showing of the last picture, which lasts until `end`.
+    /// Returns the showing of the last picture, which lasts until `end`, if it is still open.
     Showing Finish(int64_t end);
 
 private:
     std::optional<int64_t> TickOf(int64_t time);
     int64_t GridIndex(int64_t time) const;
     Showing ShowUntil(int64_t index);
-    Showing ShowOnce();
 
     const PictureClock clock_;
     const bool keepStamps_;
     std::optional<int64_t> origin_;   ///< Time of the first picture.
     std::optional<int64_t> lastTick_; ///< The last tick or grid index given out.
-    std::optional<int64_t> pending_;  ///< Tick or grid index of the picture whose showing is still open.
+    std::optional<int64_t> pending_;  ///< Grid index of the picture whose showing is still open.
 };
 
 } // namespace writer

@@ -70,24 +70,27 @@ void PictureStage::Join() {
 }
 
 void PictureStage::Run() {
+    av::Frame open; // the picture whose showing is still open
     int64_t end = 0;
     while (std::optional<av::Frame> frame = queue_.Pop()) {
         const int64_t time = (*frame)->pts;
         end = time + plan_.pictureLength;
-        Show(pacer_.Add(time));
-        current_ = std::move(*frame);
+        const PicturePacer::Showing showing = pacer_.Add(time);
+        // At once where possible: most of the picture is still in the processor's cache then.
+        Show(pacer_.AnswersAtOnce() ? std::move(*frame) : std::exchange(open, std::move(*frame)), showing);
     }
-    Show(pacer_.Finish(end));
+    Show(std::move(open), pacer_.Finish(end));
     encoder_.Finish(take_);
 }
 
-void PictureStage::Show(const PicturePacer::Showing& showing) {
-    if (!current_)
+/// Does nothing without a picture.
+void PictureStage::Show(av::Frame picture, const PicturePacer::Showing& showing) {
+    if (!picture)
         return;
     shown_(showing.count);
     if (showing.count == 0)
         return;
-    const av::Frame picture = scaler_.Convert(std::move(current_));
+    picture = scaler_.Convert(std::move(picture));
     for (int64_t i = 0; i < showing.count; ++i)
         encoder_.Encode(*picture, showing.tick + i * plan_.clock.ticksPerPicture, take_);
 }

@@ -50,7 +50,7 @@ public:
 
 private:
     void Run();
-    void Show(const PicturePacer::Showing& showing);
+    void Show(av::Frame picture, const PicturePacer::Showing& showing);
 
     const VideoPlan& plan_;
     VideoEncoder encoder_;
@@ -58,7 +58,6 @@ private:
     PictureScaler scaler_;
     FramePool pool_; ///< Used by Push only.
     BoundedQueue<av::Frame> queue_;
-    av::Frame current_; ///< The picture whose showing is still open.
     PacketTaker take_;
     Shown shown_;
     std::thread thread_;
