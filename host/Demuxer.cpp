@@ -12,7 +12,7 @@ namespace host {
 namespace {
 
 constexpr std::size_t kEnoughPackets = 32;
-constexpr std::size_t kEnoughBytes = 16 << 20;
+constexpr std::size_t kEnoughBytes = 1 << 20;
 constexpr int kToleratedFailures = 100;                // reads in a row that may fail on damaged data
 constexpr int64_t kLargestStep = 10 * kTicksPerSecond; // between packets of one stream; more is a new clock
 constexpr int64_t kLargestFall = kTicksPerSecond / 2;  // likewise, backwards

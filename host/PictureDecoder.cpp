@@ -10,11 +10,12 @@ namespace {
 
 constexpr std::size_t kPicturesAhead = 3;
 constexpr std::size_t kBytesAhead = 256 << 20;
-constexpr int kTrialPictures = 16;
-constexpr int kWarmUpPictures = 12;
+constexpr int kWarmUpPictures = 4;
+constexpr int kFewestJudged = 8;
+constexpr int kMostJudged = 24;
 constexpr std::size_t kTrialPackets = 400;
 constexpr unsigned kMostThreads = 16;
-constexpr double kBusy = 0.75; // share of the processors from which more threads bring nothing
+constexpr double kBusy = 0.85; // share of the processors from which more threads bring nothing
 
 std::size_t Bytes(const AVFrame& frame) {
     return static_cast<std::size_t>(frame.width) * static_cast<std::size_t>(frame.height) * 3 / 2;
@@ -105,6 +106,7 @@ void PictureDecoder::Run() {
 
 void PictureDecoder::DecodeAll() {
     const auto accept = [this](AVFrame& frame) { return Accept(frame); };
+    use_ = {};
     while (const av::Packet packet = demuxer_.Take(stream_->index)) {
         if (!decoder_->Decode(packet.get(), accept))
             return;
@@ -161,7 +163,8 @@ bool PictureDecoder::Deliver(StampRepair::Stamp stamp) {
 
 /// One thread decodes at first, which costs the least and is enough for most movies: the encoder is slower.
 /// When the queue keeps running empty, the decoder is the slower one and gets the other processors too, if
-/// the program leaves them idle. False when nobody takes pictures any more.
+/// the program leaves them idle: as soon as that is known, since all is decoded again. False when nobody
+/// takes pictures any more.
 bool PictureDecoder::ConsiderMoreThreads(av::Packet packet) {
     if (!trial_)
         return true;
@@ -171,12 +174,13 @@ bool PictureDecoder::ConsiderMoreThreads(av::Packet packet) {
     }
     trial_->push_back(std::move(packet));
     const int judged = pushed_ - kWarmUpPictures;
-    if (judged < kTrialPictures && trial_->size() < kTrialPackets)
-        return true;
-    const std::vector<av::Packet> known = *std::exchange(trial_, std::nullopt);
+    const bool known = judged >= kFewestJudged || trial_->size() >= kTrialPackets;
     const bool runsEmpty = judged <= 0 || starved_ * 2 > judged;
-    const bool leavesIdle = use_.Processors() < kBusy * std::thread::hardware_concurrency();
-    return !runsEmpty || !leavesIdle || UseMoreThreads(known);
+    if (known && runsEmpty && use_.Processors() < kBusy * std::thread::hardware_concurrency())
+        return UseMoreThreads(*std::exchange(trial_, std::nullopt));
+    if (judged >= kMostJudged || trial_->size() >= kTrialPackets)
+        trial_.reset();
+    return true;
 }
 
 /// Begins again with more threads, one more than processors since they wait for each other, and skips the

@@ -80,7 +80,7 @@ private:
         trial_; // packets since the start, until the thread count is settled
     int pushed_ = 0;
     int starved_ = 0;
-    ProcessorUse use_; // since the warm-up
+    ProcessorUse use_; // since the warm-up, of the decoding thread
     int64_t damagedBefore_ = 0;
 
     // Between the threads.

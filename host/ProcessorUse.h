@@ -1,24 +1,30 @@
-// How many processors the program keeps busy.
+// How much of the program's work one thread does.
 #ifndef MOVIECONV_HOST_PROCESSORUSE_H
 #define MOVIECONV_HOST_PROCESSORUSE_H
 
-#include <chrono>
 #include <ctime>
 
 namespace host {
 
-/// Counts from its construction.
+/// Counts from its construction, for the thread that constructs it and asks. CPU time only: what other
+/// programs take from this one does not show.
 class ProcessorUse {
 public:
-    /// Processors in use on average, by all threads of the program together.
+    /// How many processors the program would keep busy on average if this thread had never waited.
     double Processors() const {
-        const std::chrono::duration<double> wall = std::chrono::steady_clock::now() - began_;
-        return static_cast<double>(std::clock() - worked_) / CLOCKS_PER_SEC / wall.count();
+        return Elapsed(CLOCK_PROCESS_CPUTIME_ID, program_) / Elapsed(CLOCK_THREAD_CPUTIME_ID, thread_);
     }
 
 private:
-    std::chrono::steady_clock::time_point began_ = std::chrono::steady_clock::now();
-    std::clock_t worked_ = std::clock();
+    static double Seconds(clockid_t clock) {
+        timespec time{};
+        clock_gettime(clock, &time);
+        return static_cast<double>(time.tv_sec) + static_cast<double>(time.tv_nsec) / 1e9;
+    }
+    static double Elapsed(clockid_t clock, double begin) { return Seconds(clock) - begin; }
+
+    double program_ = Seconds(CLOCK_PROCESS_CPUTIME_ID);
+    double thread_ = Seconds(CLOCK_THREAD_CPUTIME_ID);
 };
 
 } // namespace host

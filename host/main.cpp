@@ -25,8 +25,6 @@ namespace {
 
 void LimitHeap() {
     mallopt(M_ARENA_MAX, 1); // heaps of their own for the dozen threads cost 20 MB and save no time
-    // Large packets go back to the system when they are freed: they would lie between what stays.
-    mallopt(M_MMAP_THRESHOLD, 64 * 1024);
 }
 
 /// Descriptors that the caller closed would be given to files and be written to as standard streams.
