@@ -15,10 +15,24 @@ constexpr int kFewestJudged = 8;
 constexpr int kMostJudged = 24;
 constexpr std::size_t kTrialPackets = 400;
 constexpr unsigned kMostThreads = 16;
+constexpr double kHeavy = 0.5; // bits in a pixel from which decoding is sure to be slower than encoding
 constexpr double kBusy = 0.85; // share of the processors from which more threads bring nothing
 
 std::size_t Bytes(const AVFrame& frame) {
     return static_cast<std::size_t>(frame.width) * static_cast<std::size_t>(frame.height) * 3 / 2;
+}
+
+/// For a decoder that is the slower side: one more than processors, since they wait for each other.
+int ManyThreads() {
+    const unsigned processors = std::thread::hardware_concurrency();
+    return processors > 1 ? static_cast<int>(std::min(processors + 1, kMostThreads)) : 1;
+}
+
+/// Whether that is known beforehand: decoding takes its time for every bit, encoding for every pixel.
+bool IsHeavy(const Source& source) {
+    const PictureStreamInfo& pictures = *source.Info().pictures;
+    const double pixelRate = pictures.frameRate * pictures.width * pictures.height;
+    return static_cast<double>(source.PictureStream()->codecpar->bit_rate) > kHeavy * pixelRate;
 }
 
 } // namespace
@@ -27,7 +41,7 @@ PictureDecoder::PictureDecoder(const Source& source, Demuxer& demuxer)
     : source_(source),
       demuxer_(demuxer),
       stream_(source.PictureStream()),
-      decoder_(std::make_unique<StreamDecoder>(*stream_, 1)),
+      decoder_(std::make_unique<StreamDecoder>(*stream_, IsHeavy(source) ? ManyThreads() : 1)),
       converter_(source.Info().pictures->quarterTurns, source.Info().pictures->mirrored),
       stamps_(ToMediaTime(1 / source.Info().pictures->frameRate)),
       queue_(kPicturesAhead, kBytesAhead,
@@ -35,7 +49,8 @@ PictureDecoder::PictureDecoder(const Source& source, Demuxer& demuxer)
               L"Movie::The conversion waits for the picture decoder"}) {
     const PictureStreamInfo& pictures = *source.Info().pictures;
     info_.format = {pictures.width, pictures.height, pictures.frameRate, pictures.duration};
-    trial_.emplace();
+    if (!IsHeavy(source))
+        trial_.emplace();
 }
 
 PictureDecoder::~PictureDecoder() {
@@ -161,10 +176,10 @@ bool PictureDecoder::Deliver(StampRepair::Stamp stamp) {
     return queue_.Push({std::move(picture), stamp}, bytes);
 }
 
-/// One thread decodes at first, which costs the least and is enough for most movies: the encoder is slower.
-/// When the queue keeps running empty, the decoder is the slower one and gets the other processors too, if
-/// the program leaves them idle: as soon as that is known, since all is decoded again. False when nobody
-/// takes pictures any more.
+/// Unless the stream is heavy, one thread decodes at first. It costs the least and is mostly enough: the
+/// encoder is slower. When the queue keeps running empty, the decoder is the slower one and gets the other
+/// processors too, if the program leaves them idle: as soon as that is known, since all is decoded again.
+/// False when nobody takes pictures any more.
 bool PictureDecoder::ConsiderMoreThreads(av::Packet packet) {
     if (!trial_)
         return true;
@@ -183,12 +198,10 @@ bool PictureDecoder::ConsiderMoreThreads(av::Packet packet) {
     return true;
 }
 
-/// Begins again with more threads, one more than processors since they wait for each other, and skips the
-/// frames that are known, whatever lies between key pictures.
+/// Begins again with more threads and skips the frames that are known, whatever lies between key pictures.
 bool PictureDecoder::UseMoreThreads(const std::vector<av::Packet>& known) {
-    const unsigned threads = std::min(std::thread::hardware_concurrency() + 1, kMostThreads);
     damagedBefore_ += decoder_->Damaged();
-    decoder_ = std::make_unique<StreamDecoder>(*stream_, static_cast<int>(threads));
+    decoder_ = std::make_unique<StreamDecoder>(*stream_, ManyThreads());
     skip_ = decoded_;
     return std::all_of(known.begin(), known.end(), [this](const av::Packet& packet) {
         return decoder_->Decode(packet.get(), [this](AVFrame& frame) { return Accept(frame); });
