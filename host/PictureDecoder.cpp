@@ -9,6 +9,7 @@ namespace host {
 namespace {
 
 constexpr std::size_t kPicturesAhead = 3;
+constexpr std::size_t kHeavyPicturesAhead = 1; // each of many decoding threads keeps a finished one as well
 constexpr std::size_t kBytesAhead = 256 << 20;
 constexpr int kWarmUpPictures = 4;
 constexpr int kFewestJudged = 8;
@@ -22,10 +23,10 @@ std::size_t Bytes(const AVFrame& frame) {
     return static_cast<std::size_t>(frame.width) * static_cast<std::size_t>(frame.height) * 3 / 2;
 }
 
-/// For a decoder that is the slower side: one more than processors, since they wait for each other.
+/// For a decoder that is the slower side: more than processors, since they wait for each other.
 int ManyThreads() {
     const unsigned processors = std::thread::hardware_concurrency();
-    return processors > 1 ? static_cast<int>(std::min(processors + 1, kMostThreads)) : 1;
+    return processors > 1 ? static_cast<int>(std::min(processors + 2, kMostThreads)) : 1;
 }
 
 /// Whether that is known beforehand: decoding takes its time for every bit, encoding for every pixel.
@@ -41,16 +42,15 @@ PictureDecoder::PictureDecoder(const Source& source, Demuxer& demuxer)
     : source_(source),
       demuxer_(demuxer),
       stream_(source.PictureStream()),
-      decoder_(std::make_unique<StreamDecoder>(*stream_, IsHeavy(source) ? ManyThreads() : 1)),
+      trial_(IsHeavy(source) ? std::nullopt : std::make_optional<std::vector<av::Packet>>()),
+      decoder_(std::make_unique<StreamDecoder>(*stream_, trial_ ? 1 : ManyThreads())),
       converter_(source.Info().pictures->quarterTurns, source.Info().pictures->mirrored),
       stamps_(ToMediaTime(1 / source.Info().pictures->frameRate)),
-      queue_(kPicturesAhead, kBytesAhead,
+      queue_(trial_ ? kPicturesAhead : kHeavyPicturesAhead, kBytesAhead,
              {L"Movie::The picture decoder waits for the conversion",
               L"Movie::The conversion waits for the picture decoder"}) {
     const PictureStreamInfo& pictures = *source.Info().pictures;
     info_.format = {pictures.width, pictures.height, pictures.frameRate, pictures.duration};
-    if (!IsHeavy(source))
-        trial_.emplace();
 }
 
 PictureDecoder::~PictureDecoder() {

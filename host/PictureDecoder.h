@@ -67,6 +67,8 @@ private:
     VideoSourceInfo info_{};
 
     // The decoding thread's.
+    std::optional<std::vector<av::Packet>>
+        trial_; // packets since the start, until the thread count is settled
     std::unique_ptr<StreamDecoder> decoder_;
     PictureConverter converter_;
     StampRepair stamps_;
@@ -76,8 +78,6 @@ private:
     int64_t decoded_ = 0;
     int64_t skip_ = 0; // frames that a restarted decoder gives once more
     bool first_ = true;
-    std::optional<std::vector<av::Packet>>
-        trial_; // packets since the start, until the thread count is settled
     int pushed_ = 0;
     int starved_ = 0;
     ProcessorUse use_; // since the warm-up, of the decoding thread

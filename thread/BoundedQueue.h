@@ -34,15 +34,20 @@ public:
     /// Waits for room. False when the queue was finished or closed: the item is gone.
     bool Push(Item item, std::size_t weight = 0) {
         std::unique_lock lock(mutex_);
-        WaitAndTell(
-            room_, lock, [&] { return finished_ || HasRoom(weight); }, sides_.full, sides_.limit);
-        if (finished_)
+        if (!AwaitRoom(lock, weight))
             return false;
         items_.emplace_back(std::move(item), weight);
         weight_ += weight;
         lock.unlock();
         item_.notify_one();
         return true;
+    }
+
+    /// Waits for room for an item that is still to be made, which saves holding it while waiting. A Push that
+    /// follows on the only pushing thread doesn't wait. False when the queue was finished or closed.
+    bool WaitForRoom(std::size_t weight) {
+        std::unique_lock lock(mutex_);
+        return AwaitRoom(lock, weight);
     }
 
     /// Waits for an item. Nothing once the queue is closed, or finished and empty.
@@ -88,6 +93,12 @@ public:
     }
 
 private:
+    bool AwaitRoom(std::unique_lock<std::mutex>& lock, std::size_t weight) {
+        WaitAndTell(
+            room_, lock, [&] { return finished_ || HasRoom(weight); }, sides_.full, sides_.limit);
+        return !finished_;
+    }
+
     bool HasRoom(std::size_t weight) const {
         return items_.empty() || (items_.size() < maxItems_ && weight_ + weight <= maxWeight_);
     }

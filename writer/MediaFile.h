@@ -1,7 +1,7 @@
 // One output file from its creation to its real name.
 //
 //     engine's worker                    encoding threads                 file
-//     WriteVideo ─ copy ─ 3 pictures ─> PictureStage ─┐
+//     WriteVideo ─ copy ─ 1 picture ──> PictureStage ─┐
 //                                                     ├─> Muxer (one lock) ─> NAME.part ─ Close ─> NAME
 //     WriteAudio ─ copy ─ 1 s of sound ─> SoundStage ─┘
 //

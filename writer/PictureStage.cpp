@@ -10,7 +10,7 @@ extern "C" {
 namespace writer {
 namespace {
 
-constexpr size_t kMostPictures = 3;
+constexpr size_t kMostPictures = 1;
 constexpr size_t kMostBytes = size_t{64} << 20;
 
 size_t ByteSize(const VideoImage& image) {
@@ -59,9 +59,12 @@ void PictureStage::Start(PacketTaker take, Shown shown, StageFailure failed) {
 }
 
 bool PictureStage::Push(const VideoImage& image, int64_t time) {
+    const size_t bytes = ByteSize(image);
+    if (!queue_.WaitForRoom(bytes))
+        return false;
     av::Frame frame = CopyPicture(pool_, image);
     frame->pts = time;
-    return queue_.Push(std::move(frame), ByteSize(image));
+    return queue_.Push(std::move(frame), bytes);
 }
 
 void PictureStage::Join() {

@@ -22,7 +22,7 @@ namespace {
 Gate g_disk;
 
 /// What the picture encoder's full queue holds, and the picture that waits for room in it.
-constexpr int64_t kPicturesHeld = 3 + 1;
+constexpr int64_t kPicturesHeld = 1 + 1;
 
 WriterStatus Status() {
     WriterStatus status{};

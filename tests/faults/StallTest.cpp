@@ -5,6 +5,7 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <atomic>
 #include <thread>
 
 namespace {
@@ -40,6 +41,22 @@ TEST(StallTest, BothSidesOfAQueueAreNamedOnce) {
     giver.join();
     EXPECT_EQ(Lines("A waits for room"), 2);
     EXPECT_EQ(Lines("A waits for room no longer, after "), 1);
+}
+
+TEST(BoundedQueueTest, RoomIsAwaitedBeforeTheItemIsMade) {
+    recorder::Reset();
+    BoundedQueue<int> queue(1, 1, kSides);
+    std::atomic<int> made{0};
+    std::thread giver([&] {
+        while (queue.WaitForRoom(1))
+            queue.Push(++made, 1);
+    });
+    AwaitLine("A waits for room for 0.0");
+    EXPECT_EQ(made, 1);
+    EXPECT_EQ(queue.Pop(), 1);
+    EXPECT_EQ(queue.Pop(), 2);
+    queue.Close();
+    giver.join();
 }
 
 TEST(StallTest, NobodyIsNamedWhileItemsCome) {
