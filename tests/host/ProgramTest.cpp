@@ -10,6 +10,7 @@
 #include <cstdio>
 #include <fcntl.h>
 #include <filesystem>
+#include <ostream>
 #include <sys/mount.h>
 #include <sys/stat.h>
 #include <thread>
@@ -100,6 +101,12 @@ struct Odd {
     double sound; // seconds
     Args options = {};
 };
+
+void PrintTo(const Odd& odd, std::ostream* out) {
+    *out << odd.name << " to " << odd.output;
+    for (const std::string& option : odd.options)
+        *out << ' ' << option;
+}
 
 class ProgramTakes : public testing::TestWithParam<Odd> {};
 
