@@ -45,7 +45,7 @@ public:
 
     /// Waits for room for an item that is still to be made, which saves holding it while waiting. A Push that
     /// follows on the only pushing thread doesn't wait. False when the queue was finished or closed.
-    bool WaitForRoom(std::size_t weight) {
+    bool WaitForRoom(std::size_t weight = 0) {
         std::unique_lock lock(mutex_);
         return AwaitRoom(lock, weight);
     }

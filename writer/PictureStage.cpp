@@ -10,12 +10,7 @@ extern "C" {
 namespace writer {
 namespace {
 
-constexpr size_t kMostPictures = 1;
-constexpr size_t kMostBytes = size_t{64} << 20;
-
-size_t ByteSize(const VideoImage& image) {
-    return static_cast<size_t>(image.nWidth) * static_cast<size_t>(image.nHeight) * 3 / 2;
-}
+constexpr size_t kMostPictures = 1; // whatever it weighs
 
 av::Frame CopyPicture(FramePool& pool, const VideoImage& image) {
     av::Frame frame = pool.Get(AV_PIX_FMT_YUV420P, image.nWidth, image.nHeight);
@@ -37,7 +32,7 @@ PictureStage::PictureStage(const VideoPlan& plan, EncoderFlags flags)
       encoder_(*plan.codec, plan.settings, flags, plan.clock.ticksPerPicture),
       pacer_(plan.clock, plan.keepStamps),
       scaler_(plan.picture, plan.sourceAspect, plan.stretch, plan.sourceFullRange),
-      queue_(kMostPictures, kMostBytes,
+      queue_(kMostPictures, 0,
              {L"MediaWriter::The conversion waits for the picture encoder",
               L"MediaWriter::The picture encoder waits for the conversion"}) {}
 
@@ -59,12 +54,11 @@ void PictureStage::Start(PacketTaker take, Shown shown, StageFailure failed) {
 }
 
 bool PictureStage::Push(const VideoImage& image, int64_t time) {
-    const size_t bytes = ByteSize(image);
-    if (!queue_.WaitForRoom(bytes))
+    if (!queue_.WaitForRoom())
         return false;
     av::Frame frame = CopyPicture(pool_, image);
     frame->pts = time;
-    return queue_.Push(std::move(frame), bytes);
+    return queue_.Push(std::move(frame));
 }
 
 void PictureStage::Join() {
