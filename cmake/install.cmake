@@ -50,7 +50,7 @@ install_link(${CMAKE_INSTALL_LIBDIR} libmovieconv.so.${PROJECT_VERSION_MAJOR}
              ${home_dir}/libmovieconv.so.${PROJECT_VERSION_MAJOR})
 install_link(${CMAKE_INSTALL_LIBDIR} libmovieconv.so ${home_dir}/libmovieconv.so)
 
-install(FILES host/movieconv.1 DESTINATION ${CMAKE_INSTALL_MANDIR}/man1)
+install(FILES host/terminal/movieconv.1 DESTINATION ${CMAKE_INSTALL_MANDIR}/man1)
 install(FILES README.md CHANGELOG.md DESTINATION ${doc_dir})
 install(DIRECTORY docs DESTINATION ${doc_dir})
 install(FILES LICENSE DESTINATION ${doc_dir} RENAME copyright)

@@ -1,8 +1,8 @@
 // What the program makes of a source's time stamps: pictures that rise, sound on one clock, whatever they
 // say.
 #include "fuzz/Fuzz.h"
-#include "host/SoundTimeline.h"
-#include "host/StampRepair.h"
+#include "host/source/SoundTimeline.h"
+#include "host/source/StampRepair.h"
 #include "media/MediaRecords.h"
 
 #include <algorithm>
@@ -28,10 +28,10 @@ std::optional<int64_t> NextStamp(FuzzedDataProvider& input, int64_t due) {
 
 void FuzzPictures(FuzzedDataProvider& input) {
     const int64_t step = input.ConsumeIntegralInRange<int64_t>(1, 1 << 30);
-    host::StampRepair repair(step);
+    movieconv::StampRepair repair(step);
     std::optional<int64_t> last;
     int64_t given = 0;
-    const auto take = [&](const std::optional<host::StampRepair::Stamp>& stamp) {
+    const auto take = [&](const std::optional<movieconv::StampRepair::Stamp>& stamp) {
         if (!stamp)
             return;
         ++given;
@@ -48,7 +48,7 @@ void FuzzPictures(FuzzedDataProvider& input) {
 void FuzzSound(FuzzedDataProvider& input) {
     const int rate = input.PickValueInArray({8000, 44100, 48000, 384000});
     const int64_t begin = WildInteger<int64_t>(input, 0) >> 4;
-    host::SoundTimeline timeline(rate, begin);
+    movieconv::SoundTimeline timeline(rate, begin);
     for (int64_t due = begin; input.remaining_bytes() > 0;) {
         const int64_t samples = input.ConsumeIntegralInRange(1, 8192);
         const int64_t before = timeline.Position();

@@ -1,7 +1,7 @@
 // The functions on texts: the log module's, UTF-8, a program's place as a URL, the notations of the command
 // line.
 #include "fuzz/Fuzz.h"
-#include "host/Units.h"
+#include "host/terminal/Units.h"
 #include "log/dyLog.h"
 #include "platform/BundleUrl.h"
 #include "tests/log/ScriptedBundle.h"
@@ -102,19 +102,19 @@ void FuzzUtf8(FuzzedDataProvider& input) {
 
 void FuzzUnits(FuzzedDataProvider& input) {
     const double seconds = WildDouble(input, input.ConsumeFloatingPointInRange(0.0, 1e6));
-    const auto shown = host::ParseTime(host::FormatTime(seconds, true));
+    const auto shown = movieconv::ParseTime(movieconv::FormatTime(seconds, true));
     FUZZ_CHECK(shown && (!(seconds >= 0 && seconds <= 1e9) || std::abs(*shown - seconds) < 0.000501));
-    FUZZ_CHECK(!host::FormatBytes(input.ConsumeIntegral<int64_t>()).empty());
+    FUZZ_CHECK(!movieconv::FormatBytes(input.ConsumeIntegral<int64_t>()).empty());
 
     const std::string text = input.ConsumeRemainingBytesAsString();
-    const auto time = host::ParseTime(text);
+    const auto time = movieconv::ParseTime(text);
     FUZZ_CHECK(!time || (std::isfinite(*time) && *time >= 0));
-    const auto rate = host::ParseRate(text);
+    const auto rate = movieconv::ParseRate(text);
     FUZZ_CHECK(!rate || *rate > 0);
-    const auto size = host::ParseSize(text);
+    const auto size = movieconv::ParseSize(text);
     FUZZ_CHECK(!size ||
                (size->width >= 2 && size->width <= 32768 && size->height >= 2 && size->height <= 32768));
-    const auto pictures = host::ParseFrameRate(text);
+    const auto pictures = movieconv::ParseFrameRate(text);
     FUZZ_CHECK(!pictures || (*pictures > 0 && *pictures <= 200));
 }
 

@@ -1,5 +1,5 @@
 // The decoders against real movies, whole, damaged and odd, called as the engine calls them.
-#include "host/Movie.h"
+#include "host/source/Movie.h"
 #include "tests/host/Inspect.h"
 #include "tests/host/TestMovies.h"
 
@@ -13,7 +13,7 @@ namespace {
 
 using namespace test_movies;
 using namespace inspect;
-using host::Movie;
+using movieconv::Movie;
 
 Args H264Aac() {
     return {"-c:v", "libx264", "-preset", "veryfast", "-bf", "2", "-g", "30", "-c:a", "aac"};

@@ -41,7 +41,7 @@ void TakeSound(AudioDecoder& decoder, Seen& seen) {
 
 } // namespace
 
-Seen TakeAll(host::Movie& movie, double begin) {
+Seen TakeAll(movieconv::Movie& movie, double begin) {
     Seen seen;
     VideoDecoder* pictures = movie.Pictures();
     AudioDecoder* sound = movie.Sound();
@@ -64,7 +64,7 @@ Seen TakeAll(host::Movie& movie, double begin) {
 }
 
 Seen LookAt(const std::string& path, double begin) {
-    host::Movie movie(path, {});
+    movieconv::Movie movie(path, {});
     return TakeAll(movie, begin);
 }
 

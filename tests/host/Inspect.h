@@ -2,7 +2,7 @@
 #ifndef MOVIECONV_TESTS_HOST_INSPECT_H
 #define MOVIECONV_TESTS_HOST_INSPECT_H
 
-#include "host/Movie.h"
+#include "host/source/Movie.h"
 
 #include <cstdint>
 #include <string>
@@ -28,7 +28,7 @@ struct Seen {
 
 /// Everything from `begin` on, pictures first: the decoders must not depend on an even interleaving of the
 /// calls.
-Seen TakeAll(host::Movie& movie, double begin = 0);
+Seen TakeAll(movieconv::Movie& movie, double begin = 0);
 Seen LookAt(const std::string& path, double begin = 0);
 
 /// Times at which the sound becomes loud after at least 0.3 s of quiet.

@@ -1,14 +1,14 @@
-#include "host/JsonReporter.h"
-#include "host/SpeedMeter.h"
-#include "host/TextReporter.h"
-#include "host/Units.h"
-#include "host/WorkClock.h"
+#include "host/convert/SpeedMeter.h"
+#include "host/convert/WorkClock.h"
+#include "host/terminal/JsonReporter.h"
+#include "host/terminal/TextReporter.h"
+#include "host/terminal/Units.h"
 
 #include <gtest/gtest.h>
 
 namespace {
 
-using namespace host;
+using namespace movieconv;
 
 TEST(Units, ReadTimes) {
     EXPECT_EQ(ParseTime("83.5"), 83.5);

@@ -44,7 +44,7 @@ TEST(Program, WritesEveryPictureOnceAndAllSound) {
     EXPECT_EQ(result.out.find('\r'), std::string::npos);
     EXPECT_EQ(folder.Names(), Args{"out.mp4"});
 
-    host::Movie movie(folder / "out.mp4", {});
+    movieconv::Movie movie(folder / "out.mp4", {});
     EXPECT_EQ(movie.Info().pictures->codec, "mpeg4");
     EXPECT_EQ(movie.Info().sound->codec, "aac");
     EXPECT_NEAR(movie.Info().duration, 4, 0.04);
@@ -74,7 +74,7 @@ TEST(Program, KeepsSoundAndPicturesInStep) {
         std::size_t pictures = 0;
         std::size_t flashes = 0;
         for (const std::string& name : folder.Names()) {
-            host::Movie movie(folder / name, {});
+            movieconv::Movie movie(folder / name, {});
             const Seen seen = TakeAll(movie);
             const std::vector<double> light = Flashes(seen);
             const std::vector<double> sound = Beginnings(seen, movie.Info().sound->sampleRate);
@@ -116,7 +116,7 @@ TEST_P(ProgramTakes, AndConvertsAll) {
     const std::string source = Make(std::string("odd-") + odd.name, odd.making);
     const Result result = Call(Join(Args{source, folder / odd.output}, odd.options));
     ASSERT_EQ(result.code, 0) << result.err;
-    host::Movie movie(folder / odd.output, {});
+    movieconv::Movie movie(folder / odd.output, {});
     const Seen seen = TakeAll(movie);
     EXPECT_EQ(seen.pictures.size(), odd.pictures);
     const double seconds =

@@ -1,6 +1,6 @@
-#include "host/MediaTime.h"
-#include "host/SoundTimeline.h"
-#include "host/StampRepair.h"
+#include "host/source/MediaTime.h"
+#include "host/source/SoundTimeline.h"
+#include "host/source/StampRepair.h"
 
 #include <gtest/gtest.h>
 
@@ -9,8 +9,8 @@
 
 namespace {
 
-using host::SoundTimeline;
-using host::StampRepair;
+using movieconv::SoundTimeline;
+using movieconv::StampRepair;
 
 constexpr int64_t kStep = 400'000;
 constexpr std::optional<int64_t> kNone;

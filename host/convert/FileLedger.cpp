@@ -1,0 +1,104 @@
+#include "host/convert/FileLedger.h"
+
+#include "host/convert/OutputCheck.h"
+#include "host/terminal/Units.h"
+#include "text/Path.h"
+
+#include <algorithm>
+#include <cmath>
+#include <cstring>
+#include <fmt/format.h>
+
+namespace movieconv {
+namespace {
+
+constexpr double kLengthTolerance = 0.1; // seconds: a picture or a codec's frame, at any usual rate
+
+/// The exit code for what went wrong with a file.
+ExitCode CodeOf(const WriterStatus& failure) {
+    switch (failure.nError) {
+    case kWriterErrorArgument:
+    case kWriterErrorFormat:
+    case kWriterErrorCodec:
+        return ExitCode::kUsage;
+    case kWriterErrorNoSpace:
+        return ExitCode::kNoSpace;
+    case kWriterErrorInternal:
+        return ExitCode::kInternal;
+    default:
+        return ExitCode::kCannotWrite;
+    }
+}
+
+/// What went wrong, where, and what remains.
+std::string TextOf(const WriterStatus& failure) {
+    std::string text =
+        fmt::format("cannot write \"{}\": {}", failure.szPath,
+                    failure.szWhat[0] != '\0' ? failure.szWhat : "the media writer gave no reason");
+    if (text.back() == '.') // the writer's sentence goes on below
+        text.pop_back();
+    if (failure.nSystemError != 0 &&
+        std::strstr(failure.szWhat, std::strerror(failure.nSystemError)) == nullptr)
+        text += fmt::format(" ({})", std::strerror(failure.nSystemError));
+    if (failure.nError == kWriterErrorNoSpace) {
+        const int64_t free = FreeBytes(text::FolderOf(failure.szPath));
+        text += fmt::format("; {} were written, {} are free: make room or choose another disk",
+                            FormatBytes(failure.llBytesWritten), FormatBytes(free > 0 ? free : 0));
+    } else if (failure.nError == kWriterErrorCodec || failure.nError == kWriterErrorFormat) {
+        text += "; see \"movieconv --list-formats\"";
+    }
+    if (failure.szTemporaryPath[0] != '\0')
+        text += fmt::format("; what was written so far is in \"{}\"", failure.szTemporaryPath);
+    return text;
+}
+
+/// Compares a complete file with what was sent into it. Empty when everything is there.
+std::string MissingFrom(const WriterStatus& file) {
+    const auto compare = [&](const char* what, double written, double received, double frame) {
+        if (std::abs(written - received) <= std::max(kLengthTolerance, frame))
+            return std::string();
+        return fmt::format("\"{}\" holds {:.3f} s of {}, but {:.3f} s were sent into it", file.szPath,
+                           written, what, received);
+    };
+    const std::string pictures =
+        compare("pictures", file.dVideoWritten, file.dVideoReceived,
+                file.dVideoWritten / static_cast<double>(std::max<int64_t>(1, file.llPicturesWritten)));
+    return pictures.empty() ? compare("sound", file.dAudioWritten, file.dAudioReceived, 0.0) : pictures;
+}
+
+} // namespace
+
+bool FileLedger::Enter(const WriterWatch::News& news) {
+    const bool wasWell = !failure_;
+    switch (news.event) {
+    case kWriterEventOpened:
+        ++opened_;
+        finishing_.reset();
+        reporter_.FileOpened(opened_, news.status.szPath);
+        break;
+    case kWriterEventFinishing:
+        finishing_ = news.status.dFinished;
+        break;
+    case kWriterEventClosed:
+        finishing_ = 1; // until the next clip or the end
+        EnterClosed(news.status);
+        break;
+    default:
+        break;
+    }
+    if (news.status.nError != kWriterErrorNone && wasWell && !failure_)
+        failure_.emplace(CodeOf(news.status), TextOf(news.status));
+    return !(wasWell && failure_);
+}
+
+void FileLedger::EnterClosed(const WriterStatus& file) {
+    if (file.nState != kWriterFileComplete)
+        return;
+    ++complete_;
+    bytes_ += file.llBytesWritten;
+    reporter_.FileClosed({opened_, file.szPath, file.dVideoWritten, file.dAudioWritten, file.llBytesWritten});
+    if (const std::string missing = MissingFrom(file); !missing.empty() && !failure_)
+        failure_.emplace(ExitCode::kInternal, missing);
+}
+
+} // namespace movieconv

@@ -1,0 +1,45 @@
+// The books of a conversion's output files: what was opened, closed, lost.
+#ifndef MOVIECONV_HOST_CONVERT_FILELEDGER_H
+#define MOVIECONV_HOST_CONVERT_FILELEDGER_H
+
+#include "host/convert/WriterWatch.h"
+#include "host/terminal/ExitCode.h"
+#include "host/terminal/Reporter.h"
+
+#include <optional>
+#include <string>
+
+namespace movieconv {
+
+/// The main thread's.
+class FileLedger {
+public:
+    explicit FileLedger(Reporter& reporter) : reporter_(reporter) {}
+
+    /// Enters what the writer told and reports it. False when a file has failed for the first time.
+    bool Enter(const WriterWatch::News& news);
+
+    int Opened() const { return opened_; }
+    int Complete() const { return complete_; }
+    int64_t Bytes() const { return bytes_; } ///< Of the complete files.
+
+    /// How much of the last file's finishing is done, 0 to 1; nothing while it takes pictures and sound.
+    std::optional<double> Finishing() const { return finishing_; }
+
+    /// What went wrong first; nothing when all is well.
+    const std::optional<Failure>& FirstFailure() const { return failure_; }
+
+private:
+    void EnterClosed(const WriterStatus& file);
+
+    Reporter& reporter_;
+    int opened_ = 0;
+    int complete_ = 0;
+    int64_t bytes_ = 0;
+    std::optional<double> finishing_;
+    std::optional<Failure> failure_;
+};
+
+} // namespace movieconv
+
+#endif

@@ -1,0 +1,111 @@
+#include "host/convert/Formats.h"
+
+#include "media/FourCC.h"
+#include "media/MediaWriter.h"
+
+#include <algorithm>
+#include <cctype>
+#include <fmt/format.h>
+#include <iterator>
+
+namespace movieconv {
+namespace {
+
+char Lower(char c) {
+    return static_cast<char>(std::tolower(static_cast<unsigned char>(c)));
+}
+
+bool SameIgnoringCase(std::string_view a, std::string_view b) {
+    return std::equal(a.begin(), a.end(), b.begin(), b.end(),
+                      [](char x, char y) { return Lower(x) == Lower(y); });
+}
+
+bool HasExtension(const FileFormatInfo& format, std::string_view extension) {
+    std::string_view list = format.szExtensions;
+    for (;;) {
+        const std::size_t comma = list.find(',');
+        if (SameIgnoringCase(list.substr(0, comma), extension))
+            return true;
+        if (comma == std::string_view::npos)
+            return false;
+        list.remove_prefix(comma + 1);
+    }
+}
+
+template <class Matches>
+const FileFormatInfo* FindIf(Matches matches) {
+    for (const FileFormatInfo* format = MWGetFileFormatInfos(); format != nullptr && format->fccFormat != 0;
+         ++format)
+        if (matches(*format))
+            return format;
+    return nullptr;
+}
+
+template <std::size_t N>
+std::string CodecList(const uint32_t (&codes)[N]) {
+    std::string list;
+    for (const uint32_t code : codes) {
+        if (code == 0)
+            break;
+        list += (list.empty() ? "" : ", ") + CodeName(code);
+    }
+    return list.empty() ? "none" : list;
+}
+
+/// "mp4,m4v" as ".mp4, .m4v".
+std::string ExtensionList(std::string list) {
+    for (std::size_t comma = list.find(','); comma != std::string::npos; comma = list.find(',', comma + 1))
+        list.replace(comma, 1, ", .");
+    return "." + list;
+}
+
+} // namespace
+
+const FileFormatInfo* FindFormat(std::string_view name) {
+    const std::optional<uint32_t> code = ParseCode(name);
+    return FindIf([&](const FileFormatInfo& format) {
+        return (code && format.fccFormat == *code) || HasExtension(format, name);
+    });
+}
+
+const FileFormatInfo* FindFormatOfFile(std::string_view path) {
+    const std::string_view name = path.substr(path.rfind('/') + 1);
+    const std::size_t dot = name.rfind('.');
+    if (dot == std::string_view::npos)
+        return nullptr;
+    return FindIf([&](const FileFormatInfo& format) { return HasExtension(format, name.substr(dot + 1)); });
+}
+
+std::optional<uint32_t> ParseCode(std::string_view text) {
+    if (text.empty() || text.size() > 4)
+        return std::nullopt;
+    char code[4] = {' ', ' ', ' ', ' '};
+    std::transform(text.begin(), text.end(), code,
+                   [](char c) { return static_cast<char>(std::toupper(static_cast<unsigned char>(c))); });
+    return FourCC(code[0], code[1], code[2], code[3]);
+}
+
+std::string CodeName(uint32_t code) {
+    std::string name;
+    for (int shift = 0; shift < 32; shift += 8)
+        name += static_cast<char>(code >> shift & 0xFF);
+    return name.substr(0, name.find_last_not_of(' ') + 1);
+}
+
+std::string ListFormats() {
+    std::string text;
+    FindIf([&](const FileFormatInfo& format) {
+        fmt::format_to(std::back_inserter(text), "{:<5} {} ({})\n", CodeName(format.fccFormat), format.szName,
+                       ExtensionList(format.szExtensions));
+        if (format.bHasVideo != 0)
+            fmt::format_to(std::back_inserter(text), "      pictures: {}\n",
+                           CodecList(format.fccVideoCodecs));
+        if (format.bHasAudio != 0)
+            fmt::format_to(std::back_inserter(text), "      sound:    {}\n",
+                           CodecList(format.fccAudioCodecs));
+        return false;
+    });
+    return text;
+}
+
+} // namespace movieconv

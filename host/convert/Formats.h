@@ -1,0 +1,31 @@
+// The media writer's file formats, as the command line names them.
+#ifndef MOVIECONV_HOST_CONVERT_FORMATS_H
+#define MOVIECONV_HOST_CONVERT_FORMATS_H
+
+#include "media/EncodeParam.h"
+
+#include <cstdint>
+#include <optional>
+#include <string>
+#include <string_view>
+
+namespace movieconv {
+
+/// The format named by `name`, a four-character code or an extension, in any case. Null when there is none.
+const FileFormatInfo* FindFormat(std::string_view name);
+
+/// The format that the extension of a file name stands for. Null when it has none or an unknown one.
+const FileFormatInfo* FindFormatOfFile(std::string_view path);
+
+/// "H264" from "h264", "AAC " from "aac". Nothing for more than four characters or none.
+std::optional<uint32_t> ParseCode(std::string_view text);
+
+/// The characters of a code, without the spaces at its end.
+std::string CodeName(uint32_t code);
+
+/// The table for --list-formats.
+std::string ListFormats();
+
+} // namespace movieconv
+
+#endif

@@ -1,0 +1,189 @@
+#include "host/convert/Preview.h"
+
+#include "Common/Image/ImageConvert.h"
+#include "ffmpeg/AvHandles.h"
+
+#include <cerrno>
+#include <chrono>
+#include <cstdio>
+#include <cstring>
+#include <fmt/format.h>
+#include <memory>
+#include <new>
+#include <utility>
+
+namespace movieconv {
+namespace {
+
+constexpr std::chrono::seconds kInterval{1};
+
+std::size_t Half(int size) {
+    return static_cast<std::size_t>(size + 1) / 2;
+}
+
+void CopyPlane(std::vector<uint8_t>& target, const uint8_t* plane, int pitch, std::size_t width,
+               std::size_t height) {
+    for (std::size_t y = 0; y < height; ++y) {
+        const uint8_t* row = plane + static_cast<ptrdiff_t>(y) * pitch;
+        target.insert(target.end(), row, row + width);
+    }
+}
+
+/// Blue, green, red, 255, top row first, to the red, green, blue that PNG wants.
+av::Frame ToRgb(const std::vector<uint8_t>& bgra, int width, int height) {
+    av::Frame frame = av::NewFrame();
+    frame->format = AV_PIX_FMT_RGB24;
+    frame->width = width;
+    frame->height = height;
+    if (av_frame_get_buffer(frame.get(), 0) < 0)
+        return nullptr;
+    const uint8_t* source = bgra.data();
+    for (int y = 0; y < height; ++y) {
+        uint8_t* target = frame->data[0] + static_cast<ptrdiff_t>(y) * frame->linesize[0];
+        for (int x = 0; x < width; ++x, source += 4, target += 3) {
+            target[0] = source[2];
+            target[1] = source[1];
+            target[2] = source[0];
+        }
+    }
+    return frame;
+}
+
+av::Packet EncodePng(const AVFrame& frame) {
+    const AVCodec* codec = avcodec_find_encoder(AV_CODEC_ID_PNG);
+    const av::CodecContext context(codec != nullptr ? avcodec_alloc_context3(codec) : nullptr);
+    av::Packet packet = av::NewPacket();
+    if (!context)
+        return nullptr;
+    context->width = frame.width;
+    context->height = frame.height;
+    context->pix_fmt = AV_PIX_FMT_RGB24;
+    context->time_base = {1, 1};
+    context->thread_count = 1;
+    context->compression_level = 1;
+    const bool encoded = avcodec_open2(context.get(), codec, nullptr) >= 0 &&
+                         avcodec_send_frame(context.get(), &frame) >= 0 &&
+                         avcodec_receive_packet(context.get(), packet.get()) >= 0;
+    return encoded ? std::move(packet) : nullptr;
+}
+
+/// A new file beside `path`, whose name goes to `temporary`. Null with errno set.
+std::FILE* CreateBeside(const std::string& path, std::string& temporary) {
+    constexpr int kMostNumbers = 1000;
+    std::FILE* file = nullptr;
+    for (int number = 1; number <= kMostNumbers && file == nullptr; ++number) {
+        temporary = path + ".part" + (number == 1 ? "" : std::to_string(number));
+        file = std::fopen(temporary.c_str(), "wbxe");
+        if (file == nullptr && errno != EEXIST)
+            break;
+    }
+    return file;
+}
+
+/// Empty on success, else what went wrong.
+std::string ReplaceFile(const std::string& path, const AVPacket& content) {
+    std::string temporary;
+    std::FILE* file = CreateBeside(path, temporary);
+    if (file == nullptr)
+        return std::strerror(errno);
+    const auto size = static_cast<std::size_t>(content.size);
+    std::string reason;
+    if (std::fwrite(content.data, 1, size, file) != size)
+        reason = std::strerror(errno);
+    if (std::fclose(file) != 0 && reason.empty())
+        reason = std::strerror(errno);
+    if (reason.empty() && std::rename(temporary.c_str(), path.c_str()) != 0)
+        reason = std::strerror(errno);
+    if (!reason.empty())
+        std::remove(temporary.c_str());
+    return reason;
+}
+
+} // namespace
+
+Preview::Preview(std::string path) : path_(std::move(path)), thread_(&Preview::Run, this) {}
+
+Preview::~Preview() {
+    Join();
+}
+
+void Preview::Offer(const VideoImage& image) noexcept {
+    if (image.nWidth <= 0 || image.nHeight <= 0)
+        return;
+    try {
+        const std::lock_guard lock(mutex_);
+        fresh_ = false;
+        latest_.width = image.nWidth;
+        latest_.height = image.nHeight;
+        latest_.planes.clear();
+        const auto width = static_cast<std::size_t>(image.nWidth);
+        const auto height = static_cast<std::size_t>(image.nHeight);
+        CopyPlane(latest_.planes, image.pY, image.nPitchY, width, height);
+        CopyPlane(latest_.planes, image.pU, image.nPitchU, Half(image.nWidth), Half(image.nHeight));
+        CopyPlane(latest_.planes, image.pV, image.nPitchV, Half(image.nWidth), Half(image.nHeight));
+        fresh_ = true;
+    } catch (const std::bad_alloc&) {
+        return;
+    }
+    changed_.notify_all();
+}
+
+void Preview::Join() {
+    {
+        const std::lock_guard lock(mutex_);
+        finishing_ = true;
+    }
+    changed_.notify_all();
+    if (thread_.joinable())
+        thread_.join();
+}
+
+std::string Preview::Finish() {
+    Join();
+    return failure_.empty() ? failure_ : fmt::format("cannot write the preview \"{}\": {}", path_, failure_);
+}
+
+void Preview::Run() {
+    Picture picture;
+    std::unique_lock lock(mutex_);
+    for (;;) {
+        changed_.wait(lock, [&] { return fresh_ || finishing_; });
+        if (!fresh_)
+            return;
+        fresh_ = false;
+        std::swap(picture, latest_);
+        lock.unlock();
+        try {
+            Write(picture);
+        } catch (const std::bad_alloc&) {
+            failure_ = "no memory"; // short enough to need none
+        }
+        lock.lock();
+        changed_.wait_for(lock, kInterval, [&] { return finishing_; });
+    }
+}
+
+void Preview::Write(Picture& picture) {
+    tagBITMAPINFOHEADER header{};
+    header.biSize = sizeof header;
+    header.biWidth = picture.width;
+    header.biHeight = picture.height;
+    header.biPlanes = 1;
+    header.biBitCount = 32;
+    const auto width = static_cast<std::size_t>(picture.width);
+    const auto height = static_cast<std::size_t>(picture.height);
+    std::vector<uint8_t> bgra(width * height * 4);
+    uint8_t* luma = picture.planes.data();
+    uint8_t* blue = luma + width * height;
+    uint8_t* red = blue + Half(picture.width) * Half(picture.height);
+    const int chromaPitch = static_cast<int>(Half(picture.width));
+    Yuv420_2_Argb(&header, bgra.data(), luma, blue, red, picture.width, chromaPitch, chromaPitch);
+
+    const av::Frame rgb = ToRgb(bgra, picture.width, picture.height);
+    const av::Packet png = rgb ? EncodePng(*rgb) : nullptr;
+    std::string reason = png ? ReplaceFile(path_, *png) : "the picture could not be encoded";
+    if (failure_.empty())
+        failure_ = std::move(reason);
+}
+
+} // namespace movieconv

@@ -1,0 +1,47 @@
+// How long the program has been working, pauses left out.
+#ifndef MOVIECONV_HOST_CONVERT_WORKCLOCK_H
+#define MOVIECONV_HOST_CONVERT_WORKCLOCK_H
+
+#include <chrono>
+
+namespace movieconv {
+
+/// Belongs to one thread. Times are on the steady clock, which the caller reads.
+class WorkClock {
+public:
+    using Time = std::chrono::steady_clock::time_point;
+
+    explicit WorkClock(Time now) : last_(now) {}
+
+    /// Counts the time since the last call unless the clock stands. To be called regularly.
+    void Tick(Time now) {
+        if (!stands_)
+            worked_ += now - last_;
+        last_ = now;
+    }
+
+    /// Leaves out the time since the last Tick: the whole process was suspended.
+    void Skip(Time now) { last_ = now; }
+
+    void Stand(Time now) {
+        Tick(now);
+        stands_ = true;
+    }
+    void Go(Time now) {
+        Tick(now);
+        stands_ = false;
+    }
+
+    /// When it was told the time last.
+    Time Last() const { return last_; }
+    double Seconds() const { return std::chrono::duration<double>(worked_).count(); }
+
+private:
+    Time last_;
+    std::chrono::steady_clock::duration worked_{};
+    bool stands_ = false;
+};
+
+} // namespace movieconv
+
+#endif

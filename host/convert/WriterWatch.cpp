@@ -1,0 +1,119 @@
+#include "host/convert/WriterWatch.h"
+
+#include "host/convert/HostEvents.h"
+#include "host/convert/OutputCheck.h"
+#include "text/Path.h"
+
+#include <cerrno>
+#include <chrono>
+#include <memory>
+#include <new>
+#include <unistd.h>
+#include <utility>
+
+namespace movieconv {
+namespace {
+
+constexpr std::chrono::seconds kRetryInterval{1};
+constexpr int64_t kEnoughRoom = 4 << 20;
+
+} // namespace
+
+WriterWatch::WriterWatch(const Options& options, const SourceInfo& source) {
+    WriterOptions writer{};
+    if (source.pictures) {
+        writer.nSampleAspectNum = source.pictures->pixelAspect.num;
+        writer.nSampleAspectDen = source.pictures->pixelAspect.den;
+        writer.nColorPrimaries = source.pictures->colorPrimaries;
+        writer.nColorTransfer = source.pictures->colorTransfer;
+        writer.nColorMatrix = source.pictures->colorMatrix;
+    }
+    writer.bKeepExisting = options.overwrite ? 0 : 1;
+    writer.bRemovePartial = options.keepPartial ? 0 : 1;
+    writer.pfnListener = OnEvent;
+    writer.pfnFullDisk = options.onFull == OnFull::kWait ? OnFullDisk : nullptr;
+    writer.pContext = this;
+    MWSetWriterOptions(&writer);
+}
+
+WriterWatch::~WriterWatch() {
+    MWSetWriterOptions(nullptr);
+}
+
+std::optional<WriterWatch::News> WriterWatch::Take() {
+    const std::lock_guard lock(mutex_);
+    if (std::exchange(newsLost_, false))
+        throw std::bad_alloc();
+    if (news_.empty())
+        return std::nullopt;
+    std::optional<News> news(news_.front());
+    news_.pop_front();
+    return news;
+}
+
+void WriterWatch::GiveUp() {
+    {
+        const std::lock_guard lock(mutex_);
+        givenUp_ = true;
+    }
+    changed_.notify_all();
+}
+
+int64_t WriterWatch::Bytes() const {
+    const auto status = std::make_unique<WriterStatus>();
+    const bool open = MWGetFileStatus(MWGetFileCount(), status.get()) != 0 &&
+                      (status->nState == kWriterFileWriting || status->nState == kWriterFileFinishing);
+    return closedBytes_ + (open ? status->llBytesWritten : 0);
+}
+
+bool WriterWatch::FileVanished() {
+    const auto before = std::make_unique<WriterStatus>();
+    const auto after = std::make_unique<WriterStatus>();
+    const auto isWritten = [](WriterStatus& status) {
+        return MWGetFileStatus(MWGetFileCount(), &status) != 0 && status.nState == kWriterFileWriting &&
+               status.szTemporaryPath[0] != '\0';
+    };
+    // A close may give the file its name in between.
+    return isWritten(*before) && access(before->szTemporaryPath, F_OK) != 0 && errno == ENOENT &&
+           isWritten(*after) && before->nSequence == after->nSequence;
+}
+
+void WriterWatch::OnEvent(void* context, int event, const WriterStatus* status) {
+    auto* watch = static_cast<WriterWatch*>(context);
+    {
+        const std::lock_guard lock(watch->mutex_);
+        try {
+            watch->news_.push_back({event, *status});
+        } catch (const std::bad_alloc&) {
+            watch->newsLost_ = true;
+        }
+    }
+    if (event == kWriterEventClosed)
+        watch->closedBytes_ += status->llBytesWritten;
+    PostHostEvent(EventKind::kWriterNews);
+}
+
+int WriterWatch::OnFullDisk(void* context, const WriterStatus* status) {
+    try {
+        return static_cast<WriterWatch*>(context)->WaitForRoom(*status);
+    } catch (const std::bad_alloc&) {
+        return 0;
+    }
+}
+
+/// Nothing announces free space, so it is asked for every second.
+int WriterWatch::WaitForRoom(const WriterStatus& status) {
+    const std::string folder = text::FolderOf(status.szPath);
+    waiting_ = true;
+    PostHostEvent(EventKind::kWriterNews);
+    bool givenUp = false;
+    do {
+        std::unique_lock lock(mutex_);
+        givenUp = changed_.wait_for(lock, kRetryInterval, [&] { return givenUp_; });
+    } while (!givenUp && FreeBytes(folder) < kEnoughRoom);
+    waiting_ = false;
+    PostHostEvent(EventKind::kWriterNews);
+    return givenUp ? 0 : 1;
+}
+
+} // namespace movieconv

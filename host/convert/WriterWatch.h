@@ -1,0 +1,62 @@
+// What the media writer tells about its files, brought from its threads to the main thread.
+#ifndef MOVIECONV_HOST_CONVERT_WRITERWATCH_H
+#define MOVIECONV_HOST_CONVERT_WRITERWATCH_H
+
+#include "host/source/Source.h"
+#include "host/terminal/Options.h"
+#include "writer/WriterStatus.h"
+
+#include <atomic>
+#include <condition_variable>
+#include <cstdint>
+#include <deque>
+#include <mutex>
+#include <optional>
+
+namespace movieconv {
+
+/// Sets the writer's options for as long as it exists. There is one at a time.
+class WriterWatch {
+public:
+    struct News {
+        int event; ///< kWriterEvent...
+        WriterStatus status;
+    };
+
+    WriterWatch(const Options& options, const SourceInfo& source);
+    ~WriterWatch();
+    WriterWatch(const WriterWatch&) = delete;
+    WriterWatch& operator=(const WriterWatch&) = delete;
+
+    /// The oldest news that was not taken yet. Throws std::bad_alloc once when there was no memory for some.
+    std::optional<News> Take();
+
+    /// Whether the writer waits for room on a full disk.
+    bool WaitsForRoom() const { return waiting_; }
+
+    /// Whether the file that is being written has lost its place, by its own removal or the folder's.
+    static bool FileVanished();
+
+    /// Ends that waiting: the file fails.
+    void GiveUp();
+
+    /// Bytes of all files created since this object was made, as they stand.
+    int64_t Bytes() const;
+
+private:
+    static void OnEvent(void* context, int event, const WriterStatus* status);
+    static int OnFullDisk(void* context, const WriterStatus* status);
+    int WaitForRoom(const WriterStatus& status);
+
+    mutable std::mutex mutex_;
+    std::condition_variable changed_;
+    std::deque<News> news_;
+    bool newsLost_ = false;
+    bool givenUp_ = false;
+    std::atomic<bool> waiting_{false};
+    std::atomic<int64_t> closedBytes_{0};
+};
+
+} // namespace movieconv
+
+#endif

@@ -1,0 +1,98 @@
+// Reads packets ahead on a thread of its own and hands them to the decoding threads.
+//
+// One thread reads; at most one thread takes the packets of each stream. Reading stops while the queues hold
+// enough, but never while one of them is empty: a badly interleaved file may need many packets of one stream
+// before the next one of the other arrives.
+#ifndef MOVIECONV_HOST_SOURCE_DEMUXER_H
+#define MOVIECONV_HOST_SOURCE_DEMUXER_H
+
+#include "host/source/Source.h"
+#include "thread/Stall.h"
+
+#include <condition_variable>
+#include <deque>
+#include <exception>
+#include <map>
+#include <mutex>
+#include <string>
+#include <thread>
+
+namespace movieconv {
+
+class Demuxer {
+public:
+    explicit Demuxer(Source& source);
+    ~Demuxer();
+    Demuxer(const Demuxer&) = delete;
+    Demuxer& operator=(const Demuxer&) = delete;
+
+    /// Moves so far back that everything from `seconds` on can be decoded. Only before the first packet is
+    /// taken; a second call with the same time does nothing, so that both decoders may ask. False when the
+    /// source cannot be sought: it is then read from its start.
+    bool Seek(double seconds);
+
+    /// The next packet of a stream; waits for it. Null at the end of the stream or after Stop.
+    av::Packet Take(int stream);
+
+    /// Ends reading and wakes everyone who waits.
+    void Stop();
+
+    /// Does a part of the work of reading and decoding. False when it threw, for want of memory or of
+    /// threads: then both streams end and ReadError tells why.
+    template <class Work>
+    bool Attempt(Work work) {
+        try {
+            work();
+            return true;
+        } catch (...) {
+            Fail(std::current_exception());
+            return false;
+        }
+    }
+
+    /// What ended the reading early; empty when it came to the end of the file.
+    std::string ReadError() const;
+
+    /// Times that the source's clock jumped and was put right.
+    int ClockJumps() const;
+
+private:
+    struct Queue {
+        std::deque<av::Packet> packets;
+        std::size_t bytes = 0;
+    };
+
+    void Start();
+    void Run();
+    void Fail(const std::exception_ptr& failure) noexcept;
+    bool AwaitDemand();
+    bool ReadOne();
+    bool SeekBefore(double seconds);
+    bool KeyPictureAtOrBefore(int64_t mediaTime);
+    bool Holds(std::size_t packets, std::size_t bytes) const;
+    void RepairClock(AVPacket& packet);
+
+    Source& source_;
+    double soughtSeconds_ = -1;
+    bool soughtWell_ = false;
+    bool moved_ = false; // away from the start
+
+    mutable std::mutex mutex_;
+    std::condition_variable changed_;
+    std::map<int, Queue> queues_;
+    bool started_ = false;
+    bool stopping_ = false;
+    bool ended_ = false;
+    std::string readError_;
+    int clockJumps_ = 0;
+
+    int64_t clockShift_ = 0;     // media time added to stamps since the last jump of the source's clock
+    int64_t earlierShift_ = 0;   // the same before that jump
+    std::map<int, int64_t> due_; // where the next packet of a stream is expected, in media time
+    int failedReads_ = 0;
+    std::thread thread_;
+};
+
+} // namespace movieconv
+
+#endif

@@ -1,0 +1,56 @@
+// A source with its decoders: everything of the movie that one conversion needs.
+#ifndef MOVIECONV_HOST_SOURCE_MOVIE_H
+#define MOVIECONV_HOST_SOURCE_MOVIE_H
+
+#include "host/source/Demuxer.h"
+#include "host/source/PictureDecoder.h"
+#include "host/source/SoundDecoder.h"
+#include "host/source/Source.h"
+
+#include <memory>
+#include <string>
+#include <vector>
+
+namespace movieconv {
+
+class Movie {
+public:
+    /// Opens the movie and its decoders. Throws SourceError.
+    Movie(const std::string& path, SourceChoice choice);
+
+    const SourceInfo& Info() const { return source_.Info(); }
+
+    /// Null when the movie has no such stream or it was not asked for.
+    VideoDecoder* Pictures() { return pictures_.get(); }
+    AudioDecoder* Sound() { return sound_.get(); }
+
+    /// The picture handed out last, null without one. Once the conversion has ended.
+    const VideoImage* LastPicture() const { return pictures_ ? pictures_->Last() : nullptr; }
+
+    /// Leaves out the pictures from that time on, where the engine would write one more. Only before the
+    /// conversion.
+    void EndPicturesAt(double seconds);
+
+    /// Ends both streams at once, so that nobody waits for a slow source. Any thread.
+    void Stop();
+
+    /// Seconds of sound handed out since the begin time; 0 without sound. Any thread.
+    double SoundSeconds() const { return sound_ ? sound_->SecondsDelivered() : 0; }
+
+    /// Why reading ended before the end of the source; empty when it did not. Any thread.
+    std::string ReadError() const { return demuxer_.ReadError(); }
+
+    /// What was wrong with the movie and has been put right or skipped, a sentence each. Once both streams
+    /// ended.
+    std::vector<std::string> Complaints() const;
+
+private:
+    Source source_;
+    Demuxer demuxer_;
+    std::unique_ptr<PictureDecoder> pictures_;
+    std::unique_ptr<SoundDecoder> sound_;
+};
+
+} // namespace movieconv
+
+#endif

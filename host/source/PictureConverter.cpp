@@ -1,0 +1,105 @@
+#include "host/source/PictureConverter.h"
+
+#include <cstddef>
+#include <new>
+#include <utility>
+
+namespace movieconv {
+namespace {
+
+av::Frame NewPicture(int width, int height) {
+    av::Frame picture = av::NewFrame();
+    picture->format = AV_PIX_FMT_YUV420P;
+    picture->width = width;
+    picture->height = height;
+    picture->color_range = AVCOL_RANGE_MPEG;
+    if (av_frame_get_buffer(picture.get(), 0) < 0)
+        throw std::bad_alloc();
+    return picture;
+}
+
+bool IsFullRange(const AVFrame& picture) {
+    return picture.color_range == AVCOL_RANGE_JPEG || picture.format == AV_PIX_FMT_YUVJ420P;
+}
+
+/// Copies a plane so that target pixel (x, y) is source pixel `origin` + x * `stepX` + y * `stepY`.
+struct Walk {
+    const uint8_t* origin;
+    ptrdiff_t stepX;
+    ptrdiff_t stepY;
+};
+
+Walk WalkFor(const uint8_t* plane, ptrdiff_t pitch, int width, int height, int quarterTurns, bool mirrored) {
+    Walk walk{plane, 1, pitch};
+    if (mirrored) {
+        walk.origin += width - 1;
+        walk.stepX = -1;
+    }
+    // A clockwise turn: the target's rows run up the source's columns.
+    for (int turn = 0; turn < quarterTurns; ++turn) {
+        walk = {walk.origin + walk.stepY * (height - 1), -walk.stepY, walk.stepX};
+        std::swap(width, height);
+    }
+    return walk;
+}
+
+void CopyPlane(const Walk& walk, uint8_t* target, ptrdiff_t pitch, int width, int height) {
+    constexpr int kBlock = 32; // pixels; keeps the columns that a turned row crosses in the cache
+    for (int top = 0; top < height; top += kBlock) {
+        for (int left = 0; left < width; left += kBlock) {
+            for (int y = top; y < height && y < top + kBlock; ++y) {
+                const uint8_t* source = walk.origin + walk.stepY * y + walk.stepX * left;
+                uint8_t* row = target + pitch * y;
+                for (int x = left; x < width && x < left + kBlock; ++x, source += walk.stepX)
+                    row[x] = *source;
+            }
+        }
+    }
+}
+
+} // namespace
+
+av::Frame PictureConverter::Convert(AVFrame& picture) {
+    av::Frame converted;
+    if (picture.format == AV_PIX_FMT_YUV420P && !IsFullRange(picture)) {
+        converted = av::NewFrame();
+        av_frame_move_ref(converted.get(), &picture);
+    } else {
+        converted = Scale(picture);
+    }
+    const bool upright = quarterTurns_ == 0 && !mirrored_;
+    return converted && !upright ? Turn(*converted) : std::move(converted);
+}
+
+av::Frame PictureConverter::Scale(const AVFrame& picture) {
+    const auto format = static_cast<AVPixelFormat>(picture.format);
+    scaler_.reset(sws_getCachedContext(scaler_.release(), picture.width, picture.height, format,
+                                       picture.width, picture.height, AV_PIX_FMT_YUV420P,
+                                       SWS_BICUBIC | SWS_ACCURATE_RND, nullptr, nullptr, nullptr));
+    av::Frame converted = NewPicture(picture.width, picture.height);
+    if (!scaler_)
+        return nullptr;
+    const int* coefficients = sws_getCoefficients(picture.colorspace);
+    sws_setColorspaceDetails(scaler_.get(), coefficients, IsFullRange(picture) ? 1 : 0, coefficients, 0, 0,
+                             1 << 16, 1 << 16);
+    const int rows = sws_scale(scaler_.get(), picture.data, picture.linesize, 0, picture.height,
+                               converted->data, converted->linesize);
+    return rows > 0 ? std::move(converted) : nullptr;
+}
+
+av::Frame PictureConverter::Turn(const AVFrame& picture) const {
+    const bool onSide = quarterTurns_ % 2 != 0;
+    const int width = onSide ? picture.height : picture.width;
+    const int height = onSide ? picture.width : picture.height;
+    av::Frame turned = NewPicture(width, height);
+    for (int plane = 0; plane < 3; ++plane) {
+        const int shift = plane == 0 ? 0 : 1;
+        const auto part = [&](int size) { return (size + shift) >> shift; };
+        const Walk walk = WalkFor(picture.data[plane], picture.linesize[plane], part(picture.width),
+                                  part(picture.height), quarterTurns_, mirrored_);
+        CopyPlane(walk, turned->data[plane], turned->linesize[plane], part(width), part(height));
+    }
+    return turned;
+}
+
+} // namespace movieconv

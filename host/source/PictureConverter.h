@@ -1,0 +1,30 @@
+// Brings decoded pictures into the one form that the engine takes: upright 8-bit planar 4:2:0, video range.
+#ifndef MOVIECONV_HOST_SOURCE_PICTURECONVERTER_H
+#define MOVIECONV_HOST_SOURCE_PICTURECONVERTER_H
+
+#include "ffmpeg/AvHandles.h"
+
+namespace movieconv {
+
+class PictureConverter {
+public:
+    /// Pictures are mirrored left to right if asked for and then turned clockwise by so many times 90
+    /// degrees.
+    PictureConverter(int quarterTurns, bool mirrored) : quarterTurns_(quarterTurns), mirrored_(mirrored) {}
+
+    /// The picture in the engine's form. One that has it already is passed on without a copy. Null when it
+    /// cannot be converted, as with a damaged size.
+    av::Frame Convert(AVFrame& picture);
+
+private:
+    av::Frame Scale(const AVFrame& picture);
+    av::Frame Turn(const AVFrame& picture) const;
+
+    const int quarterTurns_;
+    const bool mirrored_;
+    av::Scaler scaler_;
+};
+
+} // namespace movieconv
+
+#endif

@@ -1,0 +1,211 @@
+#include "host/source/PictureDecoder.h"
+
+#include "host/source/MediaTime.h"
+
+#include <algorithm>
+#include <utility>
+
+namespace movieconv {
+namespace {
+
+constexpr std::size_t kPicturesAhead = 3;
+constexpr std::size_t kHeavyPicturesAhead = 1; // each of many decoding threads keeps a finished one as well
+constexpr std::size_t kBytesAhead = 256 << 20;
+constexpr int kWarmUpPictures = 4;
+constexpr int kFewestJudged = 8;
+constexpr int kMostJudged = 24;
+constexpr std::size_t kTrialPackets = 400;
+constexpr unsigned kMostThreads = 16;
+constexpr double kHeavy = 0.5; // bits in a pixel from which decoding is sure to be slower than encoding
+constexpr double kBusy = 0.85; // share of the processors from which more threads bring nothing
+
+std::size_t Bytes(const AVFrame& frame) {
+    return static_cast<std::size_t>(frame.width) * static_cast<std::size_t>(frame.height) * 3 / 2;
+}
+
+/// For a decoder that is the slower side: more than processors, since they wait for each other.
+int ManyThreads() {
+    const unsigned processors = std::thread::hardware_concurrency();
+    return processors > 1 ? static_cast<int>(std::min(processors + 2, kMostThreads)) : 1;
+}
+
+/// Whether that is known beforehand: decoding takes its time for every bit, encoding for every pixel.
+bool IsHeavy(const Source& source) {
+    const PictureStreamInfo& pictures = *source.Info().pictures;
+    const double pixelRate = pictures.frameRate * pictures.width * pictures.height;
+    return static_cast<double>(source.PictureStream()->codecpar->bit_rate) > kHeavy * pixelRate;
+}
+
+} // namespace
+
+PictureDecoder::PictureDecoder(const Source& source, Demuxer& demuxer)
+    : source_(source),
+      demuxer_(demuxer),
+      stream_(source.PictureStream()),
+      trial_(IsHeavy(source) ? std::nullopt : std::make_optional<std::vector<av::Packet>>()),
+      decoder_(std::make_unique<StreamDecoder>(*stream_, trial_ ? 1 : ManyThreads())),
+      converter_(source.Info().pictures->quarterTurns, source.Info().pictures->mirrored),
+      stamps_(ToMediaTime(1 / source.Info().pictures->frameRate)),
+      queue_(trial_ ? kPicturesAhead : kHeavyPicturesAhead, kBytesAhead,
+             {L"Movie::The picture decoder waits for the conversion",
+              L"Movie::The conversion waits for the picture decoder"}) {
+    const PictureStreamInfo& pictures = *source.Info().pictures;
+    info_.format = {pictures.width, pictures.height, pictures.frameRate, pictures.duration};
+}
+
+PictureDecoder::~PictureDecoder() {
+    Stop();
+    demuxer_.Stop();
+    if (thread_.joinable())
+        thread_.join();
+}
+
+double PictureDecoder::Seek(double seconds, int /*mode*/) {
+    if (!thread_.joinable()) {
+        begin_ = ToMediaTime(seconds);
+        demuxer_.Seek(seconds);
+    }
+    return seconds;
+}
+
+void PictureDecoder::EndAt(double seconds) {
+    end_ = ToMediaTime(seconds);
+}
+
+VideoImage* PictureDecoder::GetCurrentImage() {
+    if (!ended_ && !current_.frame) {
+        ended_ =
+            !demuxer_.Attempt([this] { thread_ = std::thread(&PictureDecoder::Run, this); }) || !Advance();
+    }
+    return ended_ ? nullptr : &image_;
+}
+
+int PictureDecoder::DecodeNext(int /*mode*/) {
+    ended_ = ended_ || !Advance();
+    return ended_ ? 0 : 1;
+}
+
+/// Makes the next picture the current one; the last one stays when there is none.
+bool PictureDecoder::Advance() {
+    std::optional<Picture> next = queue_.Pop();
+    if (!next)
+        return false;
+    current_ = std::move(*next);
+    const AVFrame& frame = *current_.frame;
+    image_ = {};
+    image_.nType = kMediaTypePicture;
+    image_.nFormat = kPictureFormatPlanar420;
+    image_.pY = frame.data[0];
+    image_.pU = frame.data[1];
+    image_.pV = frame.data[2];
+    image_.nWidth = frame.width;
+    image_.nHeight = frame.height;
+    image_.nPitchY = frame.linesize[0];
+    image_.nPitchU = frame.linesize[1];
+    image_.nPitchV = frame.linesize[2];
+    image_.llTime = image_.llTime2 = current_.stamp.time;
+    image_.nDuration = static_cast<int32_t>(std::min<int64_t>(current_.stamp.duration, INT32_MAX));
+    return true;
+}
+
+void PictureDecoder::Run() {
+    demuxer_.Attempt([this] {
+        DecodeAll();
+        if (const auto last = stamps_.Finish(); last && held_)
+            Deliver(*last);
+    });
+    repaired_ = stamps_.Repaired();
+    damaged_ = damagedBefore_ + decoder_->Damaged();
+    queue_.Finish();
+}
+
+void PictureDecoder::DecodeAll() {
+    const auto accept = [this](AVFrame& frame) { return Accept(frame); };
+    use_ = {};
+    while (const av::Packet packet = demuxer_.Take(stream_->index)) {
+        if (!decoder_->Decode(packet.get(), accept))
+            return;
+        damaged_ = damagedBefore_ + decoder_->Damaged();
+        if (!ConsiderMoreThreads(av::Packet(trial_ ? av_packet_clone(packet.get()) : nullptr)))
+            return;
+    }
+    decoder_->Decode(nullptr, accept);
+}
+
+bool PictureDecoder::Accept(AVFrame& frame) {
+    if (skip_ > 0) {
+        --skip_;
+        return true;
+    }
+    ++decoded_;
+    std::optional<int64_t> stamp;
+    if (frame.best_effort_timestamp != AV_NOPTS_VALUE)
+        stamp = source_.MediaTime(frame.best_effort_timestamp, stream_);
+    const auto previous = stamps_.Push(stamp);
+    if (previous && !Deliver(*previous)) {
+        held_.reset();
+        return false;
+    }
+    held_ = av::NewFrame();
+    av_frame_move_ref(held_.get(), &frame);
+    return true;
+}
+
+/// Hands the held picture on, unless it is over before the conversion begins. False when that ends before it,
+/// or nobody takes it any more.
+bool PictureDecoder::Deliver(StampRepair::Stamp stamp) {
+    if (end_ && stamp.time >= *end_)
+        return false;
+    if (begin_ && stamp.time + stamp.duration <= *begin_)
+        return true;
+    if (const int64_t begin = begin_.value_or(0); first_ && (begin_ || stamp.time > begin)) {
+        stamp.duration += stamp.time - begin;
+        stamp.time = begin;
+    }
+    av::Frame picture = converter_.Convert(*held_);
+    if (!picture) {
+        ++damagedBefore_;
+        return true;
+    }
+    first_ = false;
+    if (++pushed_ == kWarmUpPictures)
+        use_ = {};
+    else if (pushed_ > kWarmUpPictures && queue_.Size() == 0)
+        ++starved_;
+    const std::size_t bytes = Bytes(*picture);
+    return queue_.Push({std::move(picture), stamp}, bytes);
+}
+
+/// Unless the stream is heavy, one thread decodes at first. It costs the least and is mostly enough: the
+/// encoder is slower. When the queue keeps running empty, the decoder is the slower one and gets the other
+/// processors too, if the program leaves them idle: as soon as that is known, since all is decoded again.
+/// False when nobody takes pictures any more.
+bool PictureDecoder::ConsiderMoreThreads(av::Packet packet) {
+    if (!trial_)
+        return true;
+    if (!packet) { // no memory for its copy: the decoder stays as it is
+        trial_.reset();
+        return true;
+    }
+    trial_->push_back(std::move(packet));
+    const int judged = pushed_ - kWarmUpPictures;
+    const bool known = judged >= kFewestJudged || trial_->size() >= kTrialPackets;
+    const bool runsEmpty = judged <= 0 || starved_ * 2 > judged;
+    if (known && runsEmpty && use_.Processors() < kBusy * std::thread::hardware_concurrency())
+        return UseMoreThreads(*std::exchange(trial_, std::nullopt));
+    if (judged >= kMostJudged || trial_->size() >= kTrialPackets)
+        trial_.reset();
+    return true;
+}
+
+/// Begins again with more threads and skips the frames that are known, whatever lies between key pictures.
+bool PictureDecoder::UseMoreThreads(const std::vector<av::Packet>& known) {
+    damagedBefore_ += decoder_->Damaged();
+    decoder_ = std::make_unique<StreamDecoder>(*stream_, ManyThreads());
+    skip_ = decoded_;
+    return std::all_of(known.begin(), known.end(), [this](const av::Packet& packet) {
+        return decoder_->Decode(packet.get(), [this](AVFrame& frame) { return Accept(frame); });
+    });
+}
+
+} // namespace movieconv

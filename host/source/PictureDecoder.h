@@ -1,0 +1,100 @@
+// The engine's source of pictures: decoded ahead on a thread of its own.
+//
+// The engine calls from its worker; what it is given stays valid until its next DecodeNext. The record is one
+// and the same for all pictures: after DecodeNext it carries the next picture's stamps, so that a clip begun
+// there starts at 0.
+#ifndef MOVIECONV_HOST_SOURCE_PICTUREDECODER_H
+#define MOVIECONV_HOST_SOURCE_PICTUREDECODER_H
+
+#include "host/source/Demuxer.h"
+#include "host/source/PictureConverter.h"
+#include "host/source/ProcessorUse.h"
+#include "host/source/StampRepair.h"
+#include "host/source/StreamDecoder.h"
+#include "media/Decoders.h"
+#include "thread/BoundedQueue.h"
+
+#include <atomic>
+#include <memory>
+#include <optional>
+#include <thread>
+#include <vector>
+
+namespace movieconv {
+
+class PictureDecoder final : public VideoDecoder {
+public:
+    /// The first picture handed out is the one shown at the time that Seek asked for, stamped with that time;
+    /// without Seek it is the movie's first, stamped with 0 if it comes later. Throws SourceError.
+    PictureDecoder(const Source& source, Demuxer& demuxer);
+    ~PictureDecoder();
+
+    VideoSourceInfo* GetVideoInfo() override { return &info_; }
+    double Seek(double seconds, int mode) override;
+    VideoImage* GetCurrentImage() override;
+    int DecodeNext(int mode) override;
+
+    /// Leaves out the pictures from that time on. Only before the first is taken.
+    void EndAt(double seconds);
+
+    /// Makes the pictures end now. Any thread.
+    void Stop() { queue_.Close(); }
+
+    /// Figures for the closing report. Any thread.
+    int64_t Damaged() const { return damaged_; }
+    int64_t Repaired() const { return repaired_; }
+
+    /// The picture handed out last, null without one. Once the conversion has ended.
+    const VideoImage* Last() const { return current_.frame ? &image_ : nullptr; }
+
+private:
+    struct Picture {
+        av::Frame frame;
+        StampRepair::Stamp stamp;
+    };
+
+    void Run();
+    void DecodeAll();
+    bool Accept(AVFrame& frame);
+    bool Deliver(StampRepair::Stamp stamp);
+    bool ConsiderMoreThreads(av::Packet packet);
+    bool UseMoreThreads(const std::vector<av::Packet>& known);
+    bool Advance();
+
+    const Source& source_;
+    Demuxer& demuxer_;
+    const AVStream* stream_;
+    VideoSourceInfo info_{};
+
+    // The decoding thread's.
+    std::optional<std::vector<av::Packet>>
+        trial_; // packets since the start, until the thread count is settled
+    std::unique_ptr<StreamDecoder> decoder_;
+    PictureConverter converter_;
+    StampRepair stamps_;
+    av::Frame held_; // decoded, its stamp not settled yet
+    std::optional<int64_t> begin_;
+    std::optional<int64_t> end_;
+    int64_t decoded_ = 0;
+    int64_t skip_ = 0; // frames that a restarted decoder gives once more
+    bool first_ = true;
+    int pushed_ = 0;
+    int starved_ = 0;
+    ProcessorUse use_; // since the warm-up, of the decoding thread
+    int64_t damagedBefore_ = 0;
+
+    // Between the threads.
+    BoundedQueue<Picture> queue_;
+    std::atomic<int64_t> damaged_{0};
+    std::atomic<int64_t> repaired_{0};
+    std::thread thread_;
+
+    // The engine worker's.
+    Picture current_;
+    VideoImage image_{};
+    bool ended_ = false;
+};
+
+} // namespace movieconv
+
+#endif

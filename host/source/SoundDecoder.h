@@ -1,0 +1,81 @@
+// The engine's source of sound: decoded ahead on a thread of its own, as interleaved PCM without gaps.
+//
+// The engine calls from its worker; a block stays valid until the next one is asked for.
+#ifndef MOVIECONV_HOST_SOURCE_SOUNDDECODER_H
+#define MOVIECONV_HOST_SOURCE_SOUNDDECODER_H
+
+#include "host/source/Demuxer.h"
+#include "host/source/SoundTimeline.h"
+#include "host/source/StreamDecoder.h"
+#include "media/Decoders.h"
+#include "thread/BoundedQueue.h"
+
+#include <atomic>
+#include <thread>
+#include <vector>
+
+namespace movieconv {
+
+class SoundDecoder final : public AudioDecoder {
+public:
+    /// The first sample handed out lies exactly at the time that Seek asked for, without Seek at the source's
+    /// start: sound that begins later is preceded by silence. Throws SourceError.
+    SoundDecoder(const Source& source, Demuxer& demuxer);
+    ~SoundDecoder();
+
+    AudioSourceInfo* GetAudioInfo() override { return &info_; }
+    double Seek(double seconds) override;
+    AudioFrame* GetNextFrame() override;
+
+    /// Makes the sound end now. Any thread.
+    void Stop() { queue_.Close(); }
+
+    /// Figures for progress and the closing report. Any thread.
+    int64_t Damaged() const { return damaged_; }
+    int Corrections() const { return corrections_; }
+    double SecondsDelivered() const;
+
+private:
+    using Chunk = std::vector<uint8_t>; // whole samples in the engine's form
+
+    void Run();
+    void DecodeAll();
+    bool Accept(const AVFrame& frame);
+    bool FitResampler(const AVFrame& frame);
+    Chunk Resample(const AVFrame* frame);
+    bool PushPlaced(std::optional<int64_t> stamp, const Chunk& chunk);
+    bool PushSilence(int64_t samples);
+    bool Push(Chunk chunk);
+
+    const Source& source_;
+    Demuxer& demuxer_;
+    const AVStream* stream_;
+    AudioSourceInfo info_{};
+    int64_t frameBytes_ = 0; // of one sample of all channels
+    int64_t blockBytes_ = 0;
+    int64_t begin_ = 0;
+
+    // The decoding thread's.
+    StreamDecoder decoder_;
+    av::Resampler resampler_;
+    av::ChannelLayout outputLayout_;
+    av::Frame inputForm_; // format, rate and layout that the resampler is made for
+    std::optional<SoundTimeline> timeline_;
+    int64_t damagedBefore_ = 0; // the begin, where a seek may land amid a frame
+
+    // Between the threads.
+    BoundedQueue<Chunk> queue_;
+    std::atomic<int64_t> damaged_{0};
+    std::atomic<int> corrections_{0};
+    std::atomic<int64_t> samplesDelivered_{0};
+    std::thread thread_;
+
+    // The engine worker's.
+    Chunk current_;
+    int64_t used_ = 0; // bytes of it
+    AudioFrame block_{};
+};
+
+} // namespace movieconv
+
+#endif

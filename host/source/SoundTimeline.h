@@ -1,0 +1,45 @@
+// Keeps sound on the source's clock: says how much silence to put in, or how much to leave out, before each
+// frame.
+#ifndef MOVIECONV_HOST_SOURCE_SOUNDTIMELINE_H
+#define MOVIECONV_HOST_SOURCE_SOUNDTIMELINE_H
+
+#include <cstdint>
+#include <optional>
+
+namespace movieconv {
+
+/// The timeline is a count of samples from the begin time on. Stamps that are off by less than 25 ms are the
+/// container's rounding and change nothing; larger gaps are filled and overlaps cut. A single wild stamp is
+/// ignored.
+class SoundTimeline {
+public:
+    struct Placement {
+        int64_t silence = 0; ///< Samples of silence to put in before the frame.
+        int64_t cut = 0;     ///< Samples to leave out at the frame's start, at most its length.
+    };
+
+    /// `begin` is the time of sample 0, in media time.
+    SoundTimeline(int sampleRate, int64_t begin) : sampleRate_(sampleRate), begin_(begin) {}
+
+    /// Places a frame of so many samples with its stamp in media time, nothing when it has none.
+    Placement Place(std::optional<int64_t> stamp, int64_t samples);
+
+    /// Samples on the timeline so far.
+    int64_t Position() const { return position_; }
+
+    /// Gaps filled and overlaps cut after the first frame.
+    int Corrections() const { return corrections_; }
+
+private:
+    bool IsGap(int64_t offset);
+
+    const int sampleRate_;
+    const int64_t begin_;
+    int64_t position_ = 0;
+    std::optional<int64_t> suspected_; // the last frame's offset if it was large; the next must confirm it
+    int corrections_ = 0;
+};
+
+} // namespace movieconv
+
+#endif

@@ -1,0 +1,59 @@
+#include "host/source/StreamDecoder.h"
+
+#include "host/source/Source.h"
+
+namespace movieconv {
+
+StreamDecoder::StreamDecoder(const AVStream& stream, int threads) : frame_(av::NewFrame()) {
+    const AVCodec* codec = avcodec_find_decoder(stream.codecpar->codec_id);
+    context_.reset(avcodec_alloc_context3(codec));
+    if (!context_)
+        throw std::bad_alloc();
+    av::CheckMemory(avcodec_parameters_to_context(context_.get(), stream.codecpar));
+    context_->pkt_timebase = stream.time_base;
+    context_->thread_count = threads;
+    context_->thread_type = FF_THREAD_FRAME | FF_THREAD_SLICE;
+    const int result = avcodec_open2(context_.get(), codec, nullptr);
+    av::CheckMemory(result);
+    if (result < 0) {
+        throw SourceError(std::string("cannot start the decoder ") +
+                          avcodec_get_name(stream.codecpar->codec_id) + ": " + av::ErrorText(result));
+    }
+}
+
+bool StreamDecoder::Decode(const AVPacket* packet, const Sink& sink) {
+    int result = avcodec_send_packet(context_.get(), packet);
+    while (result == AVERROR(EAGAIN)) {
+        if (!Receive(sink))
+            return false;
+        result = avcodec_send_packet(context_.get(), packet);
+    }
+    av::CheckMemory(result);
+    if (result < 0 && result != AVERROR_EOF)
+        ++damaged_;
+    return Receive(sink);
+}
+
+/// Hands out what is decoded. False at the end of the stream or when the sink wants no more.
+bool StreamDecoder::Receive(const Sink& sink) {
+    for (;;) {
+        const int result = avcodec_receive_frame(context_.get(), frame_.get());
+        if (result == AVERROR(EAGAIN))
+            return true;
+        if (result == AVERROR_EOF)
+            return false;
+        av::CheckMemory(result);
+        if (result < 0) {
+            ++damaged_;
+            return true;
+        }
+        if (frame_->decode_error_flags != 0)
+            ++damaged_;
+        const bool goesOn = sink(*frame_);
+        av_frame_unref(frame_.get());
+        if (!goesOn)
+            return false;
+    }
+}
+
+} // namespace movieconv

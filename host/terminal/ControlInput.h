@@ -1,0 +1,52 @@
+// Signals and keys, received on a thread of their own and passed on as events.
+#ifndef MOVIECONV_HOST_TERMINAL_CONTROLINPUT_H
+#define MOVIECONV_HOST_TERMINAL_CONTROLINPUT_H
+
+#include <atomic>
+#include <thread>
+
+namespace movieconv {
+
+/// Exists once. Must be made before any other thread, because it blocks the signals that it receives.
+///
+/// SIGINT, SIGTERM and SIGHUP: before Arm, and from the second one on, the program leaves at once with the
+/// shell's code for the signal; the first one after Arm becomes kStop. SIGTSTP suspends, after Arm by means
+/// of kSuspend. On a terminal the keys space and p become kPauseKey, q and Q kStop.
+class ControlInput {
+public:
+    ControlInput();
+    ~ControlInput();
+    ControlInput(const ControlInput&) = delete;
+    ControlInput& operator=(const ControlInput&) = delete;
+
+    /// From now on there is something to finish. Starts to listen to the keyboard if `keys` and there is one.
+    void Arm(bool keys);
+
+    /// Listens to the keyboard while the terminal is this job's; the shell gives it away and back without
+    /// telling. To be called now and then.
+    void FollowTerminal();
+
+    /// Suspends the whole process as the terminal asked, with the terminal as it was found, and returns when
+    /// it goes on.
+    void Suspend();
+
+private:
+    void Run();
+    void TakeSignal();
+    void TakeKeys();
+    void LeaveAtOnce(int signal);
+    void UseKeyboard();
+    void RestoreTerminal();
+
+    int signals_ = -1;
+    int wake_ = -1;
+    std::atomic<bool> armed_{false};
+    std::atomic<bool> wantsKeys_{false};
+    std::atomic<bool> keys_{false};
+    bool stopAsked_ = false; // the thread's
+    std::thread thread_;
+};
+
+} // namespace movieconv
+
+#endif

@@ -1,0 +1,103 @@
+#include "host/terminal/JsonReporter.h"
+
+#include "text/Utf8.h"
+
+#include <cmath>
+#include <fmt/format.h>
+
+namespace movieconv {
+namespace {
+
+constexpr int kSchemaVersion = 1;
+constexpr double kInterval = 0.25;
+
+std::string Number(std::optional<double> value) {
+    return value && std::isfinite(*value) ? fmt::format("{:.3f}", *value) : "null";
+}
+
+std::string_view PhaseName(Phase phase) {
+    switch (phase) {
+    case Phase::kConverting:
+        return "converting";
+    case Phase::kPaused:
+        return "paused";
+    case Phase::kFinishing:
+        return "finishing";
+    case Phase::kWaitingForRoom:
+        return "waiting_for_room";
+    }
+    return "converting";
+}
+
+} // namespace
+
+std::string JsonString(std::string_view bytes) {
+    std::wstring wide = text::FromUtf8(bytes);
+    for (wchar_t& character : wide)
+        if (character >= 0xDC80 && character <= 0xDCFF)
+            character = 0xFFFD;
+    std::string quoted = "\"";
+    for (const char c : text::ToUtf8(wide)) {
+        if (c == '"' || c == '\\') {
+            quoted += '\\';
+            quoted += c;
+        } else if (static_cast<unsigned char>(c) < 0x20 || c == 0x7F) {
+            quoted += fmt::format("\\u{:04x}", static_cast<unsigned>(c));
+        } else {
+            quoted += c;
+        }
+    }
+    return quoted + '"';
+}
+
+void JsonReporter::Print(std::string_view event, const std::string& fields) const {
+    streams_.Print(fmt::format("{{\"v\":{},\"event\":\"{}\"{}{}}}\n", kSchemaVersion, event,
+                               fields.empty() ? "" : ",", fields));
+}
+
+void JsonReporter::Start(const StartReport& report) {
+    Print("start", fmt::format("\"input\":{},\"output\":{},\"length_s\":{}", JsonString(report.input),
+                               JsonString(report.output),
+                               Number(report.lengthIsKnown ? std::optional(report.length) : std::nullopt)));
+}
+
+void JsonReporter::Progress(const ProgressReport& report, bool milestone) {
+    if (!milestone && report.worked < nextAt_)
+        return;
+    nextAt_ = report.worked + kInterval;
+    Print("progress",
+          fmt::format("\"phase\":\"{}\",\"percent\":{},\"position_s\":{},\"speed\":{},\"left_s\":{},"
+                      "\"worked_s\":{},\"bytes\":{},\"finished\":{},\"clip\":{}",
+                      PhaseName(report.phase), Number(report.percent), Number(report.position),
+                      Number(report.speed), Number(report.left), Number(report.worked), report.bytes,
+                      Number(report.finished), report.clip));
+}
+
+void JsonReporter::FileOpened(int number, const std::string& path) {
+    Print("clip_opened", fmt::format("\"number\":{},\"path\":{}", number, JsonString(path)));
+}
+
+void JsonReporter::FileClosed(const FileReport& report) {
+    Print("clip_closed", fmt::format("\"number\":{},\"path\":{},\"video_s\":{},\"audio_s\":{},\"bytes\":{}",
+                                     report.number, JsonString(report.path), Number(report.videoSeconds),
+                                     Number(report.audioSeconds), report.bytes));
+}
+
+void JsonReporter::Warning(const std::string& text) {
+    Print("warning", fmt::format("\"text\":{}", JsonString(text)));
+}
+
+void JsonReporter::Error(const std::string& text) {
+    Print("error", fmt::format("\"text\":{}", JsonString(text)));
+    streams_.PrintError(fmt::format("movieconv: error: {}\n", text));
+}
+
+void JsonReporter::End(const EndReport& report) {
+    Print("end",
+          fmt::format("\"outcome\":\"{}\",\"exit_code\":{},\"position_s\":{},\"worked_s\":{},\"bytes\":{},"
+                      "\"files\":{}",
+                      report.outcome, static_cast<int>(report.code), Number(report.position),
+                      Number(report.worked), report.bytes, report.files));
+}
+
+} // namespace movieconv

@@ -1,0 +1,36 @@
+// Reports for programs: one JSON object a line, described in docs/progress-json.md.
+#ifndef MOVIECONV_HOST_TERMINAL_JSONREPORTER_H
+#define MOVIECONV_HOST_TERMINAL_JSONREPORTER_H
+
+#include "host/terminal/Reporter.h"
+
+#include <string>
+#include <string_view>
+
+namespace movieconv {
+
+class JsonReporter final : public Reporter {
+public:
+    explicit JsonReporter(const StandardStreams& streams) : streams_(streams) {}
+
+    void Start(const StartReport& report) override;
+    void Progress(const ProgressReport& report, bool milestone) override;
+    void FileOpened(int number, const std::string& path) override;
+    void FileClosed(const FileReport& report) override;
+    void Warning(const std::string& text) override;
+    void Error(const std::string& text) override;
+    void End(const EndReport& report) override;
+
+private:
+    void Print(std::string_view event, const std::string& fields) const;
+
+    const StandardStreams& streams_;
+    double nextAt_ = 0; // seconds of work
+};
+
+/// A JSON string with its quotes. Bytes that are not UTF-8 become U+FFFD.
+std::string JsonString(std::string_view bytes);
+
+} // namespace movieconv
+
+#endif

@@ -1,0 +1,219 @@
+#include "host/terminal/Options.h"
+
+#include "host/terminal/ExitCode.h"
+
+#include <CLI/CLI.hpp>
+#include <cstdio>
+#include <fmt/format.h>
+#include <map>
+
+namespace movieconv {
+namespace {
+
+/// An option whose text `parse` turns into a value; `notation` is what the message asks for.
+template <class Value, class Target>
+CLI::Option* AddParsed(CLI::App& app, const std::string& names,
+                       std::optional<Value> (*parse)(std::string_view), Target& target,
+                       const std::string& notation, const std::string& help) {
+    const auto take = [parse, &target, notation, names](const std::string& text) {
+        const std::optional<Value> value = parse(text);
+        if (!value)
+            throw CLI::ValidationError(names, fmt::format("\"{}\" is not {}", text, notation));
+        target = *value;
+    };
+    return app.add_option_function<std::string>(names, take, help);
+}
+
+template <class Value>
+CLI::Option* AddChoice(CLI::App& app, const std::string& name, Value& target,
+                       const std::map<std::string, Value>& choices, const std::string& help) {
+    std::string list;
+    for (const auto& [word, value] : choices)
+        list += (list.empty() ? "" : "|") + word;
+    const auto take = [name, &target, choices, list](const std::string& text) {
+        const auto choice = choices.find(text);
+        if (choice == choices.end())
+            throw CLI::ValidationError(name, fmt::format("\"{}\" is not {}", text, list));
+        target = choice->second;
+    };
+    return app.add_option_function<std::string>(name, take, help)->type_name(list);
+}
+
+void AddEncoding(CLI::App& app, Options& options) {
+    const std::string group = "Format and codecs";
+    app.add_option("-f,--format", options.format,
+                   "File format, by code or extension; by default the\noutput's extension tells")
+        ->type_name("NAME")
+        ->group(group);
+    app.add_option("--video-codec", options.videoCodec, "Four-character code of the picture codec")
+        ->type_name("CODE")
+        ->group(group);
+    app.add_option("--audio-codec", options.audioCodec, "Four-character code of the sound codec")
+        ->type_name("CODE")
+        ->group(group);
+    app.add_flag("--no-video", options.noVideo, "Leave the pictures out")->group(group);
+    app.add_flag("--no-audio", options.noAudio, "Leave the sound out")->group(group);
+}
+
+void AddPictures(CLI::App& app, Options& options) {
+    const std::string group = "Pictures";
+    AddParsed(app, "--size", ParseSize, options.size, "a size from 2x2 to 32768x32768, such as 640x360",
+              "Picture size; by default the source's")
+        ->type_name("WxH")
+        ->group(group);
+    AddChoice<Fit>(app, "--fit", options.fit, {{"borders", Fit::kBorders}, {"stretch", Fit::kStretch}},
+                   "How pictures of another shape fill it: with borders\n(default) or by stretching")
+        ->group(group);
+    AddParsed(app, "--frame-rate", ParseFrameRate, options.frameRate,
+              "a frame rate up to 200, such as 25 or 30000/1001",
+              "Pictures per second; by default the source's")
+        ->type_name("N")
+        ->group(group);
+    AddParsed(app, "--video-rate", ParseRate, options.videoRate,
+              "a bit rate up to 2147M, such as 512k or 1.5M", "Bits per second, as 1.5M (default 512k)")
+        ->type_name("RATE")
+        ->group(group);
+    AddParsed(app, "--video-max-rate", ParseRate, options.videoMaxRate,
+              "a bit rate up to 2147M, such as 512k or 1.5M", "Upper bit rate: the rate becomes a target")
+        ->type_name("RATE")
+        ->group(group);
+}
+
+void AddSound(CLI::App& app, Options& options) {
+    const std::string group = "Sound";
+    app.add_option("--channels", options.channels, "Channels; by default the source's")
+        ->check(CLI::Range(1, 8).description(""))
+        ->type_name("N")
+        ->group(group);
+    app.add_option("--sample-rate", options.sampleRate, "Samples per second; by default the source's")
+        ->check(CLI::Range(4000, 384000).description(""))
+        ->type_name("HZ")
+        ->group(group);
+    AddParsed(app, "--audio-rate", ParseRate, options.audioRate, "a bit rate up to 2147M, such as 128k",
+              "Bits per second (default 128k)")
+        ->type_name("RATE")
+        ->group(group);
+    AddParsed(app, "--audio-max-rate", ParseRate, options.audioMaxRate,
+              "a bit rate up to 2147M, such as 128k", "Upper bit rate: the rate becomes a target")
+        ->type_name("RATE")
+        ->group(group);
+}
+
+void AddRange(CLI::App& app, Options& options) {
+    const std::string group = "What to convert";
+    AddParsed(app, "--begin", ParseTime, options.begin, "a time such as 83.5 or 0:01:23.5",
+              "Begin here; TIME is seconds or h:mm:ss.fff")
+        ->type_name("TIME")
+        ->group(group);
+    AddParsed(app, "--length", ParseTime, options.length, "a time such as 83.5 or 0:01:23.5",
+              "Convert so much; by default all the rest")
+        ->type_name("TIME")
+        ->group(group);
+    AddParsed(app, "--split", ParseTime, options.split, "a time such as 600 or 0:10:00",
+              "Write clips of this length: OUTPUT_00, OUTPUT_01, ...")
+        ->type_name("TIME")
+        ->group(group);
+}
+
+void AddOutput(CLI::App& app, Options& options) {
+    const std::string group = "Output";
+    app.add_flag("-y,--overwrite", options.overwrite, "Replace an existing output; by default it is refused")
+        ->group(group);
+    AddChoice<OnFull>(app, "--on-full", options.onFull, {{"stop", OnFull::kStop}, {"wait", OnFull::kWait}},
+                      "On a full disk: stop (default), or wait until there is\nroom again")
+        ->group(group);
+    app.add_flag_callback(
+           "--keep-partial", [&] { options.keepPartial = true; },
+           "After a failure keep the unfinished file, which\nplays (default)")
+        ->group(group);
+    app.add_flag_callback(
+           "--no-keep-partial", [&] { options.keepPartial = false; },
+           "After a failure remove the unfinished file")
+        ->group(group);
+    app.add_option("--preview", options.preview, "Keep this PNG file showing the picture just written")
+        ->type_name("FILE")
+        ->group(group);
+}
+
+void AddReports(CLI::App& app, Options& options) {
+    const std::string group = "Reports";
+    AddChoice<ProgressStyle>(
+        app, "--progress", options.progress,
+        {{"bar", ProgressStyle::kBar}, {"json", ProgressStyle::kJson}, {"none", ProgressStyle::kNone}},
+        "A live line, or plain lines without a terminal (bar,\nthe default); one JSON object a line; or the "
+        "end only")
+        ->group(group);
+    app.add_flag("-q,--quiet", options.quiet, "Print nothing but errors")->group(group);
+    app.add_option("--log", options.log, "Append the engine's log to this file")
+        ->type_name("FILE")
+        ->group(group);
+    const auto task = [&](const std::string& name, Task chosen, const std::string& help) {
+        return app
+            .add_flag_callback(
+                name, [&options, chosen] { options.task = chosen; }, help)
+            ->group("Instead of converting");
+    };
+    task("--info", Task::kInfo, "Tell what INPUT is");
+    task("--estimate", Task::kEstimate, "Tell how much room the output needs and what there is");
+    task("--list-formats", Task::kListFormats, "List file formats and codecs");
+}
+
+/// Formats the usage line as a reader expects it; the library's own lists every positional's type.
+class HelpFormatter : public CLI::Formatter {
+public:
+    std::string make_usage(const CLI::App* /*app*/, std::string /*name*/) const override {
+        return "Usage: movieconv [OPTIONS] INPUT OUTPUT\n";
+    }
+};
+
+void RequireNames(const Options& options) {
+    const bool needsInput = options.task != Task::kListFormats;
+    const bool needsOutput = options.task == Task::kConvert || options.task == Task::kEstimate;
+    if (needsInput && options.input.empty())
+        throw Failure(ExitCode::kUsage, "INPUT is missing; try \"movieconv --help\"");
+    if (needsOutput && options.output.empty())
+        throw Failure(ExitCode::kUsage, "OUTPUT is missing; try \"movieconv --help\"");
+    if (options.noVideo && options.noAudio)
+        throw Failure(ExitCode::kUsage, "--no-video and --no-audio together leave nothing to convert");
+    if (options.length && *options.length < 0.001)
+        throw Failure(ExitCode::kUsage, "--length must be at least 0.001 seconds");
+    if (options.split && (*options.split < 0.1 || *options.split > 2'000'000))
+        throw Failure(ExitCode::kUsage, "--split takes from 0.1 to 2000000 seconds");
+}
+
+} // namespace
+
+std::optional<Options> ParseOptions(int argc, char** argv) {
+    Options options;
+    CLI::App app{"Converts a movie to another format, picture size or codec, as one file or as\nclips.",
+                 "movieconv"};
+    app.formatter(std::make_shared<HelpFormatter>());
+    app.get_formatter()->column_width(26);
+    app.footer("A name that begins with a dash goes behind \"--\". While converting, space or p\n"
+               "pauses and resumes, q or Ctrl-C stops and keeps what is done as a playable file.\n"
+               "Exit codes: 0 done, 1 internal, 2 usage, 3 cannot read the source, 4 cannot\n"
+               "write the output, 5 no space, 6 stopped. See movieconv(1).");
+    app.set_help_flag("-h,--help", "Print this help")->group("Instead of converting");
+    app.set_version_flag("--version", "movieconv " MOVIECONV_VERSION, "Print the version")
+        ->group("Instead of converting");
+    app.add_option("INPUT", options.input, "The movie to convert, any that FFmpeg can read")->type_name("");
+    app.add_option("OUTPUT", options.output, "The file to make")->type_name("");
+    AddRange(app, options);
+    AddEncoding(app, options);
+    AddPictures(app, options);
+    AddSound(app, options);
+    AddOutput(app, options);
+    AddReports(app, options);
+    try {
+        app.parse(argc, argv);
+    } catch (const CLI::Success& asked) {
+        app.exit(asked);
+        return std::nullopt;
+    } catch (const CLI::ParseError& error) {
+        throw Failure(ExitCode::kUsage, fmt::format("{}; try \"movieconv --help\"", error.what()));
+    }
+    RequireNames(options);
+    return options;
+}
+
+} // namespace movieconv

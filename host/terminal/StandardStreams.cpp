@@ -1,0 +1,78 @@
+#include "host/terminal/StandardStreams.h"
+
+#include "host/terminal/ExitCode.h"
+#include "logsink/LogSink.h"
+#include "text/Utf8.h"
+
+extern "C" {
+#include <libavutil/log.h>
+}
+
+#include <cerrno>
+#include <cstdio>
+#include <cstring>
+#include <fcntl.h>
+#include <fmt/format.h>
+#include <new>
+#include <sys/ioctl.h>
+#include <unistd.h>
+
+namespace movieconv {
+namespace {
+
+/// FFmpeg's messages, a line each, as they would be shown at its usual level.
+void LogFfmpeg(void* source, int level, const char* format, va_list arguments) {
+    if (level > AV_LOG_WARNING)
+        return;
+    static thread_local int prefix = 1;
+    char line[1024];
+    av_log_format_line2(source, level, format, arguments, line, sizeof line, &prefix);
+    try {
+        ::Log(text::FromUtf8(line).c_str());
+    } catch (const std::bad_alloc&) { // the line is lost; FFmpeg's threads know no exceptions
+    }
+}
+
+} // namespace
+
+StandardStreams::StandardStreams(const std::optional<std::string>& logFile)
+    : output_(fcntl(1, F_DUPFD_CLOEXEC, 3)) {
+    const char* path = logFile ? logFile->c_str() : "";
+    if (LogSinkSetFile(path) == 0) {
+        throw Failure(ExitCode::kCannotWrite,
+                      fmt::format("cannot write the log \"{}\": {}", *logFile, std::strerror(errno)));
+    }
+    const int log = open(logFile ? path : "/dev/null", O_WRONLY | O_APPEND | O_CREAT | O_CLOEXEC, 0666);
+    if (log >= 0) {
+        std::fflush(stdout);
+        dup2(log, 1);
+        close(log);
+    }
+    av_log_set_callback(LogFfmpeg);
+}
+
+void StandardStreams::PrintError(std::string_view text) const {
+    Write(2, text);
+}
+
+bool StandardStreams::OutputIsTerminal() const {
+    return isatty(output_) != 0;
+}
+
+int StandardStreams::Columns() const {
+    constexpr int kUsual = 80;
+    winsize size{};
+    return ioctl(output_, TIOCGWINSZ, &size) == 0 && size.ws_col > 0 ? size.ws_col : kUsual;
+}
+
+bool StandardStreams::Write(int descriptor, std::string_view text) {
+    while (!text.empty()) {
+        const ssize_t count = write(descriptor, text.data(), text.size());
+        if (count < 0 && errno != EINTR)
+            return errno == EPIPE;
+        text.remove_prefix(count > 0 ? static_cast<std::size_t>(count) : 0);
+    }
+    return true;
+}
+
+} // namespace movieconv

@@ -1,0 +1,40 @@
+// Keeps the program's standard output to itself: the engine prints lines of its own there, which go to the
+// log instead.
+#ifndef MOVIECONV_HOST_TERMINAL_STANDARDSTREAMS_H
+#define MOVIECONV_HOST_TERMINAL_STANDARDSTREAMS_H
+
+#include <optional>
+#include <string>
+#include <string_view>
+
+namespace movieconv {
+
+/// Makes descriptor 1 the log file, or nothing without one, sends the log sink's and FFmpeg's lines the same
+/// way, and keeps the real standard output for Print. Throws Failure when the log file cannot be opened.
+class StandardStreams {
+public:
+    explicit StandardStreams(const std::optional<std::string>& logFile);
+    StandardStreams(const StandardStreams&) = delete;
+    StandardStreams& operator=(const StandardStreams&) = delete;
+
+    /// Writes to the real standard output at once. What a reader that is gone does not take is dropped;
+    /// false, with errno set, when the text is lost for another reason.
+    bool Print(std::string_view text) const { return Write(output_, text); }
+
+    /// Writes to standard error.
+    void PrintError(std::string_view text) const;
+
+    bool OutputIsTerminal() const;
+
+    /// Columns of the terminal; 80 when it does not tell.
+    int Columns() const;
+
+private:
+    static bool Write(int descriptor, std::string_view text);
+
+    int output_;
+};
+
+} // namespace movieconv
+
+#endif

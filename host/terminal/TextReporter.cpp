@@ -1,0 +1,138 @@
+#include "host/terminal/TextReporter.h"
+
+#include "host/terminal/Units.h"
+
+#include <algorithm>
+#include <array>
+#include <cmath>
+#include <fmt/format.h>
+
+namespace movieconv {
+namespace {
+
+constexpr int kLineSeconds = 5;
+constexpr int kBarColumns = 20;
+constexpr std::string_view kEraseLine = "\r\x1b[K";
+
+std::string Left(const ProgressReport& report) {
+    switch (report.phase) {
+    case Phase::kPaused:
+        return "paused";
+    case Phase::kWaitingForRoom:
+        return "disk full, waiting";
+    case Phase::kFinishing:
+        return fmt::format("finishing {:.0f}%", std::floor(report.finished * 100));
+    case Phase::kConverting:
+        break;
+    }
+    return report.left ? "left " + FormatTime(std::ceil(*report.left)) : "left -:--:--";
+}
+
+/// Whole cells of a bar for `percent`, in characters that every terminal has.
+std::string Bar(double percent) {
+    const int filled = std::clamp(static_cast<int>(percent / 100 * kBarColumns), 0, kBarColumns);
+    const std::string arrow = std::string(static_cast<std::size_t>(std::max(filled - 1, 0)), '=') + '>';
+    return fmt::format("[{:<{}}] ", arrow, kBarColumns);
+}
+
+} // namespace
+
+std::string ProgressText(const ProgressReport& report, int columns) {
+    // Tenths are cut, never rounded up: what is not done is not shown as done.
+    const std::string percent = report.percent
+                                    ? fmt::format("{:5.1f}%", std::floor(*report.percent * 10) / 10)
+                                    : std::string("   ?  ");
+    const std::string position = report.percent
+                                     ? FormatTime(report.position) + " / " + FormatTime(report.length)
+                                     : FormatTime(report.position);
+    const std::string speed = report.speed ? fmt::format("{:5.2f}x", *report.speed) : std::string("     -");
+    std::string line = percent;
+    const std::string clip = report.clip > 0 ? fmt::format("  clip {}", report.clip) : std::string();
+    for (const std::string& part :
+         {"  " + position, "  " + speed, "  " + Left(report), "  " + FormatBytes(report.bytes), clip})
+        if (line.size() + part.size() < static_cast<std::size_t>(columns))
+            line += part;
+    return line;
+}
+
+void QuietReporter::Error(const std::string& text) {
+    streams_.PrintError(fmt::format("movieconv: error: {}\n", text));
+}
+
+void SparseReporter::Warning(const std::string& text) {
+    Streams().PrintError(fmt::format("movieconv: warning: {}\n", text));
+}
+
+void SparseReporter::End(const EndReport& report) {
+    if (!report.summary.empty())
+        Streams().Print(report.summary + "\n");
+}
+
+void LineReporter::Start(const StartReport& report) {
+    const std::string length = report.lengthIsKnown ? FormatTime(report.length, true) : "length unknown";
+    Streams().Print(fmt::format("{} -> {} ({})\n", report.input, report.output, length));
+}
+
+void LineReporter::Progress(const ProgressReport& report, bool milestone) {
+    // Between clips the phase changes back and forth, which the line of the clip tells well enough.
+    const bool worthALine = milestone && report.phase != Phase::kConverting &&
+                            (report.phase != Phase::kFinishing || report.clip == 0);
+    if (!worthALine && report.worked < nextAt_)
+        return;
+    nextAt_ = report.worked + kLineSeconds;
+    constexpr int kAnyWidth = 1000;
+    Streams().Print(ProgressText(report, kAnyWidth) + "\n");
+}
+
+void LineReporter::FileClosed(const FileReport& report) {
+    Streams().Print(fmt::format("wrote {} ({}, {})\n", report.path,
+                                FormatTime(std::max(report.videoSeconds, report.audioSeconds), true),
+                                FormatBytes(report.bytes)));
+}
+
+void BarReporter::Progress(const ProgressReport& report, bool /*milestone*/) {
+    const int columns = Streams().Columns();
+    std::string line = ProgressText(report, columns);
+    if (report.percent && line.size() + kBarColumns + 3 < static_cast<std::size_t>(columns))
+        line = Bar(*report.percent) + line;
+    const bool quietPhase = report.phase == Phase::kPaused || report.phase == Phase::kWaitingForRoom;
+    const std::string colour = !colour_ ? "" : quietPhase ? "\x1b[33m" : "\x1b[32m";
+    Streams().Print(fmt::format("{}{}{}{}", kEraseLine, colour, line, colour_ ? "\x1b[0m" : ""));
+    drawn_ = true;
+}
+
+void BarReporter::FileClosed(const FileReport& report) {
+    EraseLine();
+    LineReporter::FileClosed(report);
+}
+
+void BarReporter::Warning(const std::string& text) {
+    EraseLine();
+    LineReporter::Warning(text);
+}
+
+void BarReporter::Error(const std::string& text) {
+    EraseLine();
+    LineReporter::Error(text);
+}
+
+void BarReporter::End(const EndReport& report) {
+    EraseLine();
+    LineReporter::End(report);
+}
+
+void BarReporter::LeaveLine() {
+    if (drawn_) {
+        Streams().Print("\n");
+        drawn_ = false;
+    }
+}
+
+void BarReporter::EraseLine() {
+    if (drawn_) {
+        Streams().Print(kEraseLine);
+        drawn_ = false;
+    }
+}
+
+} // namespace movieconv

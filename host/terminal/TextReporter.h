@@ -1,0 +1,67 @@
+// Reports for people: a live line on a terminal, plain lines elsewhere.
+#ifndef MOVIECONV_HOST_TERMINAL_TEXTREPORTER_H
+#define MOVIECONV_HOST_TERMINAL_TEXTREPORTER_H
+
+#include "host/terminal/Reporter.h"
+
+#include <string>
+
+namespace movieconv {
+
+/// Errors only, on standard error.
+class QuietReporter : public Reporter {
+public:
+    explicit QuietReporter(const StandardStreams& streams) : streams_(streams) {}
+    void Error(const std::string& text) override;
+
+protected:
+    const StandardStreams& Streams() const { return streams_; }
+
+private:
+    const StandardStreams& streams_;
+};
+
+/// Warnings and the closing sentence too; what --progress none asks for.
+class SparseReporter : public QuietReporter {
+public:
+    using QuietReporter::QuietReporter;
+    void Warning(const std::string& text) override;
+    void End(const EndReport& report) override;
+};
+
+/// Plain lines, one every few seconds.
+class LineReporter : public SparseReporter {
+public:
+    using SparseReporter::SparseReporter;
+    void Start(const StartReport& report) override;
+    void Progress(const ProgressReport& report, bool milestone) override;
+    void FileClosed(const FileReport& report) override;
+
+private:
+    double nextAt_ = 0; // seconds of work
+};
+
+/// One line that is drawn again and again.
+class BarReporter : public LineReporter {
+public:
+    BarReporter(const StandardStreams& streams, bool colour) : LineReporter(streams), colour_(colour) {}
+    void Progress(const ProgressReport& report, bool milestone) override;
+    void FileClosed(const FileReport& report) override;
+    void Warning(const std::string& text) override;
+    void Error(const std::string& text) override;
+    void End(const EndReport& report) override;
+    void LeaveLine() override;
+
+private:
+    void EraseLine();
+
+    const bool colour_;
+    bool drawn_ = false;
+};
+
+/// The figures of one progress line, at most `columns` wide: what does not fit is left out from the right.
+std::string ProgressText(const ProgressReport& report, int columns);
+
+} // namespace movieconv
+
+#endif

@@ -1,0 +1,109 @@
+#include "host/terminal/Units.h"
+
+#include <algorithm>
+#include <array>
+#include <charconv>
+#include <cmath>
+#include <fmt/format.h>
+
+namespace movieconv {
+namespace {
+
+constexpr double kMostSeconds = 1e9; // thirty years; keeps sums of 100 ns units far from their limit
+
+/// A plain non-negative decimal number, whatever the locale.
+std::optional<double> ParseNumber(std::string_view text) {
+    double value = 0;
+    const auto [end, error] =
+        std::from_chars(text.data(), text.data() + text.size(), value, std::chars_format::fixed);
+    const bool whole = error == std::errc() && end == text.data() + text.size();
+    if (!whole || !std::isfinite(value) || std::signbit(value))
+        return std::nullopt;
+    return value;
+}
+
+bool IsDigits(std::string_view text) {
+    return !text.empty() &&
+           std::all_of(text.begin(), text.end(), [](char c) { return c >= '0' && c <= '9'; });
+}
+
+} // namespace
+
+std::optional<double> ParseTime(std::string_view text) {
+    double whole = 0;
+    int colons = 0;
+    for (std::size_t colon = text.find(':'); colon != std::string_view::npos; colon = text.find(':')) {
+        const std::string_view part = text.substr(0, colon);
+        const auto value = ParseNumber(part);
+        if (!IsDigits(part) || ++colons > 2 || !value || (colons == 2 && *value >= 60))
+            return std::nullopt;
+        whole = (whole + *value) * 60;
+        text.remove_prefix(colon + 1);
+    }
+    const auto seconds = ParseNumber(text);
+    if (!seconds || (colons > 0 && *seconds >= 60) || whole + *seconds > kMostSeconds)
+        return std::nullopt;
+    return whole + *seconds;
+}
+
+std::optional<int32_t> ParseRate(std::string_view text) {
+    double factor = 1;
+    if (!text.empty() && (text.back() == 'k' || text.back() == 'K'))
+        factor = 1e3;
+    else if (!text.empty() && text.back() == 'M')
+        factor = 1e6;
+    if (factor > 1)
+        text.remove_suffix(1);
+    const auto number = ParseNumber(text);
+    if (!number || *number * factor < 1 || *number * factor > INT32_MAX)
+        return std::nullopt;
+    return static_cast<int32_t>(std::lround(*number * factor));
+}
+
+std::optional<Size> ParseSize(std::string_view text) {
+    const std::size_t cross = text.find('x');
+    if (cross == std::string_view::npos || !IsDigits(text.substr(0, cross)) ||
+        !IsDigits(text.substr(cross + 1)))
+        return std::nullopt;
+    const double width = *ParseNumber(text.substr(0, cross));
+    const double height = *ParseNumber(text.substr(cross + 1));
+    constexpr double kLeast = 2;
+    constexpr double kMost = 32768;
+    if (std::min(width, height) < kLeast || std::max(width, height) > kMost)
+        return std::nullopt;
+    return Size{static_cast<int32_t>(width), static_cast<int32_t>(height)};
+}
+
+std::optional<double> ParseFrameRate(std::string_view text) {
+    const std::size_t slash = text.find('/');
+    const auto number = ParseNumber(text.substr(0, slash));
+    const auto divisor =
+        slash == std::string_view::npos ? std::optional(1.0) : ParseNumber(text.substr(slash + 1));
+    constexpr double kMost = 200;
+    if (!number || !divisor || *divisor <= 0 || *number <= 0 || *number / *divisor > kMost)
+        return std::nullopt;
+    return *number / *divisor;
+}
+
+std::string FormatTime(double seconds, bool milliseconds) {
+    const double bounded = std::isfinite(seconds) ? std::clamp(seconds, 0.0, kMostSeconds) : 0;
+    const auto ms =
+        static_cast<int64_t>(milliseconds ? std::llround(bounded * 1000) : std::floor(bounded) * 1000);
+    const std::string text = fmt::format("{}:{:02}:{:02}", ms / 3'600'000, ms / 60'000 % 60, ms / 1000 % 60);
+    return milliseconds ? fmt::format("{}.{:03}", text, ms % 1000) : text;
+}
+
+std::string FormatBytes(int64_t bytes) {
+    constexpr std::array kUnits{"kB", "MB", "GB", "TB"};
+    if (bytes < 1000)
+        return fmt::format("{} B", bytes);
+    double value = static_cast<double>(bytes) / 1000;
+    std::size_t unit = 0;
+    while (value >= 999.95 && unit + 1 < kUnits.size()) {
+        value /= 1000;
+        ++unit;
+    }
+    return fmt::format("{:.1f} {}", value, kUnits[unit]);
+}
+
+} // namespace movieconv
