@@ -22,11 +22,21 @@
 namespace movieconv {
 namespace {
 
+// `timeout` signals its child and then the child's group, which must not count as the user's impatience.
+constexpr std::chrono::milliseconds kSameRequest{500};
+
+bool IsIgnored(int signal) {
+    struct sigaction action {};
+    return sigaction(signal, nullptr, &action) == 0 && action.sa_handler == SIG_IGN;
+}
+
+/// Those that the caller wants ignored, as `nohup` does, stay ignored.
 sigset_t OurSignals() {
     sigset_t set;
     sigemptyset(&set);
     for (const int signal : {SIGINT, SIGTERM, SIGHUP, SIGTSTP})
-        sigaddset(&set, signal);
+        if (!IsIgnored(signal))
+            sigaddset(&set, signal);
     return set;
 }
 
@@ -114,25 +124,30 @@ void ControlInput::Run() {
                 return;
         }
         if ((sources[0].revents & POLLIN) != 0)
-            TakeSignal();
+            TakeSignals();
         if (sources[2].revents != 0)
             TakeKeys();
     }
 }
 
-void ControlInput::TakeSignal() {
-    signalfd_siginfo info{};
-    if (read(signals_, &info, sizeof info) != sizeof info)
-        return;
-    const int signal = static_cast<int>(info.ssi_signo);
+/// Those that are pending together came at one moment, however late they are read.
+void ControlInput::TakeSignals() {
+    std::array<signalfd_siginfo, 8> pending{};
+    const ssize_t size = read(signals_, pending.data(), sizeof pending);
+    const Clock::time_point now = Clock::now();
+    for (ssize_t i = 0; i < size / static_cast<ssize_t>(sizeof pending[0]); ++i)
+        TakeSignal(static_cast<int>(pending[static_cast<std::size_t>(i)].ssi_signo), now);
+}
+
+void ControlInput::TakeSignal(int signal, Clock::time_point now) {
     if (signal == SIGTSTP && !armed_) {
         Suspend();
     } else if (signal == SIGTSTP) {
         PostHostEvent(EventKind::kSuspend);
-    } else if (!armed_ || stopAsked_) {
+    } else if (!armed_ || (stopAsked_ && now - *stopAsked_ >= kSameRequest)) {
         LeaveAtOnce(signal);
-    } else {
-        stopAsked_ = true;
+    } else if (!stopAsked_) {
+        stopAsked_ = now;
         PostHostEvent(EventKind::kStop);
     }
 }

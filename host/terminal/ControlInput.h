@@ -3,15 +3,18 @@
 #define MOVIECONV_HOST_TERMINAL_CONTROLINPUT_H
 
 #include <atomic>
+#include <chrono>
+#include <optional>
 #include <thread>
 
 namespace movieconv {
 
 /// Exists once. Must be made before any other thread, because it blocks the signals that it receives.
 ///
-/// SIGINT, SIGTERM and SIGHUP: before Arm, and from the second one on, the program leaves at once with the
-/// shell's code for the signal; the first one after Arm becomes kStop. SIGTSTP suspends, after Arm by means
-/// of kSuspend. On a terminal the keys space and p become kPauseKey, q and Q kStop.
+/// SIGINT, SIGTERM and SIGHUP: before Arm the program leaves at once with the shell's code for the signal;
+/// the first one after Arm becomes kStop, and another one half a second later or more leaves at once. SIGTSTP
+/// suspends, after Arm by means of kSuspend. A signal that is ignored at the start stays so. On a terminal
+/// the keys space and p become kPauseKey, q and Q kStop.
 class ControlInput {
 public:
     ControlInput();
@@ -31,8 +34,11 @@ public:
     void Suspend();
 
 private:
+    using Clock = std::chrono::steady_clock;
+
     void Run();
-    void TakeSignal();
+    void TakeSignals();
+    void TakeSignal(int signal, Clock::time_point now);
     void TakeKeys();
     void LeaveAtOnce(int signal);
     void UseKeyboard();
@@ -43,7 +49,7 @@ private:
     std::atomic<bool> armed_{false};
     std::atomic<bool> wantsKeys_{false};
     std::atomic<bool> keys_{false};
-    bool stopAsked_ = false; // the thread's
+    std::optional<Clock::time_point> stopAsked_; // the thread's
     std::thread thread_;
 };
 

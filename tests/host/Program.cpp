@@ -102,6 +102,22 @@ bool Running::WaitUntilSuspended() const {
     return waitpid(child_, &status, WUNTRACED) == child_ && WIFSTOPPED(status);
 }
 
+void Running::Jam() const {
+    // A description of its own: the program's writing is not to fail instead of waiting.
+    const std::string pipe = "/proc/self/fd/" + std::to_string(output_);
+    const int end = open(pipe.c_str(), O_WRONLY | O_NONBLOCK | O_CLOEXEC);
+    EXPECT_GE(end, 0);
+    while (write(end, "\n", 1) == 1) {
+    }
+    close(end);
+}
+
+bool Running::HasEnded() const {
+    siginfo_t info{};
+    return waitid(P_PID, static_cast<id_t>(child_), &info, WEXITED | WNOHANG | WNOWAIT) == 0 &&
+           info.si_pid == child_;
+}
+
 bool Running::Echoes() const {
     termios settings{};
     return tcgetattr(output_, &settings) == 0 && (settings.c_lflag & ECHO) != 0;

@@ -35,6 +35,12 @@ public:
     /// False when it ended instead.
     bool WaitUntilSuspended() const;
 
+    /// Fills the pipe that it prints into, so that it waits at its next line until what it printed is read.
+    void Jam() const;
+
+    /// Whether it has come to its end, which Finish has still to take.
+    bool HasEnded() const;
+
     /// Whether its terminal shows what is typed, as it does without the program.
     bool Echoes() const;
 

@@ -351,18 +351,44 @@ TEST_P(ProgramSignal, FinishesAPlayableFile) {
 
 INSTANTIATE_TEST_SUITE_P(Signals, ProgramSignal, testing::Values(SIGINT, SIGTERM));
 
-TEST(Program, LeavesAtOnceOnTheSecondSignal) {
+TEST(Program, LeavesAtOnceOnASignalWellAfterTheFirst) {
     const Folder folder;
-    // A codec that takes its time even for the end.
-    Running running(
-        {Minute(), folder / "out.mp4", "--video-codec", "HEVC", "--size", "960x720", "--progress", "json"},
-        false);
+    Running running(Join(Slowly(folder / "out.mp4"), Args{"--progress", "json"}), false);
     ASSERT_TRUE(running.WaitFor("\"position_s\":[1-9]"));
-    running.Signal(SIGINT);
-    running.Signal(SIGTERM);
-    const Result result = running.Finish();
-    EXPECT_TRUE(result.code == 128 + SIGTERM || result.code == 128 + SIGINT) << result.code;
-    EXPECT_FALSE(fs::exists(folder / "out.mp4"));
+    running.Jam(); // so that it cannot come to an end by itself
+    while (!running.HasEnded()) {
+        running.Signal(SIGTERM);
+        std::this_thread::sleep_for(std::chrono::milliseconds(10));
+    }
+    EXPECT_EQ(running.Finish().code, 128 + SIGTERM);
+}
+
+TEST(Program, TakesTwoSignalsAtOnceForOne) {
+    const Folder folder;
+    Running running(Join(Slowly(folder / "out.mp4"), Args{"--progress", "json"}), false);
+    ASSERT_TRUE(running.WaitFor("\"position_s\":[1-9]"));
+    running.Signal(SIGSTOP);
+    ASSERT_TRUE(running.WaitUntilSuspended());
+    for (const int signal : {SIGINT, SIGTERM, SIGCONT})
+        running.Signal(signal);
+    EXPECT_EQ(running.Finish().code, 6);
+    EXPECT_EQ(folder.Names(), Args{"out.mp4"});
+}
+
+TEST(Program, GoesOnIgnoringWhatItsCallerIgnores) {
+    const Folder folder;
+    for (const int signal : {SIGHUP, SIGINT, SIGTERM}) {
+        const auto usual = std::signal(signal, SIG_IGN); // which the program inherits
+        Running running({Counted(), folder / "out.mp4", "-y", "--progress", "json"}, false);
+        std::signal(signal, usual);
+        ASSERT_TRUE(running.WaitFor("clip_opened"));
+        running.Jam();
+        running.Signal(signal);
+        running.Signal(signal);
+        const Result result = running.Finish();
+        EXPECT_EQ(result.code, 0) << result.out;
+        EXPECT_EQ(LookAt(folder / "out.mp4").pictures.size(), 100u);
+    }
 }
 
 TEST(Program, FollowsKeysAndLeavesTheTerminalWhileItIsSuspended) {
