@@ -336,7 +336,7 @@ void FuzzRoutine(FuzzedDataProvider& input) {
     const Arguments arguments(input);
     Memory memory(input);
     std::vector<uint8_t> expected;
-    for (const image::KernelLevel level : image::kKernelLevels) {
+    for (const auto& [level, name] : image::kKernelLevels) {
         if (image::RowKernelsFor(level) == nullptr)
             continue;
         image::ForceRowKernels(level);
@@ -370,7 +370,7 @@ void FuzzKernel(FuzzedDataProvider& input) {
     const image::Size size{static_cast<ptrdiff_t>(width), input.ConsumeBool() ? 2 : 1};
     Memory memory(input);
     std::vector<uint8_t> expected;
-    for (const image::KernelLevel level : image::kKernelLevels) {
+    for (const auto& [level, name] : image::kKernelLevels) {
         const image::RowKernels* kernels = image::RowKernelsFor(level);
         if (kernels == nullptr)
             continue;

@@ -8,6 +8,7 @@
 
 #include <algorithm>
 #include <cstring>
+#include <iterator>
 
 namespace {
 
@@ -331,4 +332,11 @@ void YUV420_2_444Ex(unsigned char* pDst, unsigned char* pSrc, int W, int H) {
     if (W <= 1 || H <= 1)
         return;
     BestRowKernels().doubled({pDst, W}, {pSrc, EvenAbove(W) / 2}, {W / 2, H / 2});
+}
+
+const char* ImageConvertLevel() {
+    const RowKernels* const used = &BestRowKernels();
+    return std::find_if(std::begin(kKernelLevels), std::end(kKernelLevels),
+                        [=](const NamedLevel& each) { return RowKernelsFor(each.level) == used; })
+        ->name;
 }

@@ -12,21 +12,26 @@ constexpr int kUpToSse41 = libyuv::kCpuInitialized | libyuv::kCpuHasX86 | libyuv
 constexpr int kUpToAvx2 = kUpToSse41 | libyuv::kCpuHasSSE42 | libyuv::kCpuHasAVX | libyuv::kCpuHasAVX2 |
                           libyuv::kCpuHasERMS | libyuv::kCpuHasFMA3 | libyuv::kCpuHasF16C;
 
-constexpr Level kLevels[] = {
-    {"plain", KernelLevel::kPlain, libyuv::kCpuInitialized},
-    {"SSE4.1", KernelLevel::kSse41, kUpToSse41},
-    {"AVX2", KernelLevel::kAvx2, kUpToAvx2},
-    {"AVX-512", KernelLevel::kAvx512, -1},
-};
-static_assert(std::size(kLevels) == std::size(image::kKernelLevels));
+int libyuvFlags(KernelLevel level) {
+    switch (level) {
+    case KernelLevel::kPlain:
+        return libyuv::kCpuInitialized;
+    case KernelLevel::kSse41:
+        return kUpToSse41;
+    case KernelLevel::kAvx2:
+        return kUpToAvx2;
+    default:
+        return -1;
+    }
+}
 
 } // namespace
 
 std::vector<Level> levels() {
     std::vector<Level> found;
-    for (const Level& level : kLevels)
-        if (image::RowKernelsFor(level.kernels) != nullptr)
-            found.push_back(level);
+    for (const auto& [level, name] : image::kKernelLevels)
+        if (image::RowKernelsFor(level) != nullptr)
+            found.push_back({name, level, libyuvFlags(level)});
     return found;
 }
 

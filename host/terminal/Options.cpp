@@ -1,9 +1,11 @@
 #include "host/terminal/Options.h"
 
+#include "Common/Image/ImageConvert.h"
 #include "host/terminal/ExitCode.h"
 
 #include <CLI/CLI.hpp>
 #include <cstdio>
+#include <cstdlib>
 #include <fmt/format.h>
 #include <map>
 
@@ -181,6 +183,16 @@ void RequireNames(const Options& options) {
         throw Failure(ExitCode::kUsage, "--split takes from 0.1 to 2000000 seconds");
 }
 
+/// The version, and what a report of a fault should say of the processor.
+std::string Version() {
+    const std::string level = ImageConvertLevel();
+    std::string text = fmt::format("movieconv " MOVIECONV_VERSION "\ncolour routines: {}", level);
+    const char* const wanted = std::getenv("MOVIECONV_COLOUR_LEVEL");
+    if (wanted != nullptr && level != wanted)
+        text += fmt::format(" (MOVIECONV_COLOUR_LEVEL is \"{}\", which is not to be had here)", wanted);
+    return text;
+}
+
 } // namespace
 
 std::optional<Options> ParseOptions(int argc, char** argv) {
@@ -194,7 +206,7 @@ std::optional<Options> ParseOptions(int argc, char** argv) {
                "Exit codes: 0 done, 1 internal, 2 usage, 3 cannot read the source, 4 cannot\n"
                "write the output, 5 no space, 6 stopped. See movieconv(1).");
     app.set_help_flag("-h,--help", "Print this help")->group("Instead of converting");
-    app.set_version_flag("--version", "movieconv " MOVIECONV_VERSION, "Print the version")
+    app.set_version_flag("--version", Version, "Print the version and the colour routines' level")
         ->group("Instead of converting");
     app.add_option("INPUT", options.input, "The movie to convert, any that FFmpeg can read")->type_name("");
     app.add_option("OUTPUT", options.output, "The file to make")->type_name("");

@@ -302,6 +302,14 @@ TEST(Program, TellsAboutSourcesFormatsAndRoom) {
     EXPECT_NE(Call({"--version"}).out.find("movieconv 1."), std::string::npos);
 }
 
+TEST(Program, VersionTellsTheColourRoutinesLevel) {
+    const auto version = [](const std::string& wanted) {
+        return program::Run({"env", "MOVIECONV_COLOUR_LEVEL=" + wanted, MOVIECONV_PROGRAM, "--version"}).out;
+    };
+    EXPECT_NE(version("plain").find("\ncolour routines: plain\n"), std::string::npos) << version("plain");
+    EXPECT_NE(version("fast").find("\"fast\", which is not to be had"), std::string::npos) << version("fast");
+}
+
 TEST(Program, GetsAlongWithWhateverStandardStreams) {
     const Folder folder;
     const std::string raw = Make("raw.mpv", Join(CountedPictures(1), Args{"-f", "mpeg2video"}));

@@ -4,13 +4,22 @@
 
 #include "Common/Image/kernels/RowKernels.h"
 
+#include <ostream>
 #include <string>
 
 #include <gtest/gtest.h>
 
-inline std::string LevelName(const testing::TestParamInfo<image::KernelLevel>& info) {
-    constexpr const char* kNames[] = {"Plain", "Sse41", "Avx2", "Avx512"};
-    return kNames[static_cast<int>(info.param)];
+namespace image {
+inline void PrintTo(const NamedLevel& level, std::ostream* out) {
+    *out << level.name;
+}
+} // namespace image
+
+/// The level's name without its dot, which a test's name may not have.
+inline std::string LevelName(const testing::TestParamInfo<image::NamedLevel>& info) {
+    std::string name = info.param.name;
+    std::erase(name, '.');
+    return name;
 }
 
 #ifdef MOVIECONV_EMULATED_AVX512
@@ -20,12 +29,12 @@ extern const RowKernels kEmulatedAvx512Kernels;
 #endif
 
 /// Skips a level that the machine lacks, unless an emulation was built.
-class LevelTest : public testing::TestWithParam<image::KernelLevel> {
+class LevelTest : public testing::TestWithParam<image::NamedLevel> {
 protected:
     void SetUp() override {
-        kernels = image::RowKernelsFor(GetParam());
+        kernels = image::RowKernelsFor(GetParam().level);
 #ifdef MOVIECONV_EMULATED_AVX512
-        if (kernels == nullptr && GetParam() == image::KernelLevel::kAvx512)
+        if (kernels == nullptr && GetParam().level == image::KernelLevel::kAvx512)
             kernels = &image::kEmulatedAvx512Kernels;
 #endif
         if (kernels == nullptr)

@@ -2,6 +2,8 @@
 
 #include <algorithm>
 #include <atomic>
+#include <cstdlib>
+#include <cstring>
 #include <iterator>
 
 namespace image {
@@ -19,6 +21,24 @@ bool HasAvx512() {
            __builtin_cpu_supports("avx512vnni");
 }
 #endif
+
+/// The kernels that the user asks for; null when nothing is asked, or what this machine has not.
+const RowKernels* KernelsAskedFor() {
+    const char* const wanted = std::getenv(kLevelVariable);
+    if (wanted == nullptr)
+        return nullptr;
+    const auto* const named =
+        std::find_if(std::begin(kKernelLevels), std::end(kKernelLevels),
+                     [=](const NamedLevel& each) { return std::strcmp(each.name, wanted) == 0; });
+    return named == std::end(kKernelLevels) ? nullptr : RowKernelsFor(named->level);
+}
+
+const RowKernels* ChooseKernels() {
+    const RowKernels* kernels = KernelsAskedFor();
+    for (auto best = std::rbegin(kKernelLevels); kernels == nullptr; ++best)
+        kernels = RowKernelsFor(best->level);
+    return kernels;
+}
 
 } // namespace
 
@@ -42,8 +62,7 @@ const RowKernels* RowKernelsFor(KernelLevel level) {
 const RowKernels& BestRowKernels() {
     const RowKernels* kernels = g_kernels.load(std::memory_order_relaxed);
     if (kernels == nullptr) {
-        const auto best = std::find_if(std::rbegin(kKernelLevels), std::rend(kKernelLevels), RowKernelsFor);
-        kernels = RowKernelsFor(*best);
+        kernels = ChooseKernels();
         g_kernels.store(kernels, std::memory_order_relaxed);
     }
     return *kernels;
@@ -57,8 +76,8 @@ bool WritingPastCachesPays() {
 #endif
 }
 
-void ForceRowKernels(KernelLevel level) {
-    g_kernels.store(RowKernelsFor(level), std::memory_order_relaxed);
+void ForceRowKernels(std::optional<KernelLevel> level) {
+    g_kernels.store(level ? RowKernelsFor(*level) : nullptr, std::memory_order_relaxed);
 }
 
 } // namespace image

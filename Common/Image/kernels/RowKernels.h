@@ -10,6 +10,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <optional>
 
 namespace image {
 
@@ -68,13 +69,25 @@ inline constexpr ptrdiff_t kLargeWidthStep = 32;
 inline constexpr ptrdiff_t kLargeAlignment = 16;
 
 enum class KernelLevel { kPlain, kSse41, kAvx2, kAvx512 };
-inline constexpr KernelLevel kKernelLevels[] = {KernelLevel::kPlain, KernelLevel::kSse41, KernelLevel::kAvx2,
-                                                KernelLevel::kAvx512};
+
+/// A level with the name by which users know it.
+struct NamedLevel {
+    KernelLevel level;
+    const char* name;
+};
+inline constexpr NamedLevel kKernelLevels[] = {{KernelLevel::kPlain, "plain"},
+                                               {KernelLevel::kSse41, "sse4.1"},
+                                               {KernelLevel::kAvx2, "avx2"},
+                                               {KernelLevel::kAvx512, "avx512"}};
 
 /// The kernels of one level; null when the processor or this build lacks it.
 const RowKernels* RowKernelsFor(KernelLevel level);
 
-/// The kernels of the highest level there is, chosen once, or of the level that was forced.
+/// The environment variable that names the level to use.
+inline constexpr char kLevelVariable[] = "MOVIECONV_COLOUR_LEVEL";
+
+/// The kernels of the level that was forced, else of the one that kLevelVariable names, else of the highest
+/// there is. Chosen once; a level that there is not is passed over.
 const RowKernels& BestRowKernels();
 
 /// Whether writing past the caches pays for large targets. With AMD's processors it does, also when the
@@ -83,9 +96,9 @@ const RowKernels& BestRowKernels();
 /// memory.
 bool WritingPastCachesPays();
 
-/// Makes every later call of a routine use one level, so that tests and benchmarks can compare levels. A
-/// level that the processor lacks gives the choice back.
-void ForceRowKernels(KernelLevel level);
+/// Makes every later call of a routine use one level, so that tests and benchmarks can compare levels.
+/// Without one, or with one that the processor lacks, the next call chooses anew.
+void ForceRowKernels(std::optional<KernelLevel> level);
 
 /// The tables, one a file. Only RowKernelsFor says whether the processor can run them.
 extern const RowKernels kPlainKernels;
