@@ -64,7 +64,7 @@ Conversion::Conversion(const Options& options, Movie& movie, Reporter& reporter,
     if (options.length)
         movie.EndPicturesAt(options.begin + length_);
     if (options.preview)
-        preview_.emplace(*options.preview);
+        preview_.emplace(*options.preview, options.overwrite);
 }
 
 ExitCode Conversion::Run() {

@@ -1,6 +1,7 @@
 #include "host/convert/OutputCheck.h"
 
 #include "api/MovieConv.h"
+#include "host/convert/Preview.h"
 #include "host/terminal/ExitCode.h"
 #include "text/Path.h"
 #include "text/Utf8.h"
@@ -166,8 +167,10 @@ void CheckOutput(const Options& options) {
 void CheckSideFiles(const Options& options) {
     if (options.log)
         CheckSideFile("--log", *options.log, options);
-    if (options.preview)
+    if (options.preview) {
         CheckSideFile("--preview", *options.preview, options);
+        CheckPreview(*options.preview, options.overwrite);
+    }
     if (options.log && options.preview &&
         (*options.log == *options.preview || AreSame(*options.log, *options.preview)))
         throw Failure(ExitCode::kUsage, "--log and --preview name the same file");

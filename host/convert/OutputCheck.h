@@ -14,7 +14,7 @@ namespace movieconv {
 void CheckOutput(const Options& options);
 
 /// Throws Failure when the log or the preview would be written over the source, the output, a clip of it or
-/// its temporary file, or over each other.
+/// its temporary file, or over each other, or the preview over what is no preview.
 void CheckSideFiles(const Options& options);
 
 /// Bytes that an ordinary user can still write to the file system of `folder`; -1 when it cannot be told.

@@ -2,6 +2,11 @@
 
 #include "Common/Image/ImageConvert.h"
 #include "ffmpeg/AvHandles.h"
+#include "host/terminal/ExitCode.h"
+
+extern "C" {
+#include <libavutil/crc.h>
+}
 
 #include <cerrno>
 #include <chrono>
@@ -10,12 +15,44 @@
 #include <fmt/format.h>
 #include <memory>
 #include <new>
+#include <sys/stat.h>
+#include <system_error>
 #include <utility>
 
 namespace movieconv {
 namespace {
 
 constexpr std::chrono::seconds kInterval{1};
+constexpr std::size_t kPngHead = 33; // signature and header chunk, which come first
+
+/// The text chunk behind the head by which our pictures are known again.
+const std::string& Mark() {
+    static const std::string mark = [] {
+        std::string chunk("tEXtSoftware\0MovieConv preview", 30);
+        const AVCRC* table = av_crc_get_table(AV_CRC_32_IEEE_LE);
+        const uint32_t crc =
+            ~av_crc(table, UINT32_MAX, reinterpret_cast<const uint8_t*>(chunk.data()), chunk.size());
+        const auto bigEndian = [](uint32_t value) {
+            return std::string{static_cast<char>(value >> 24), static_cast<char>(value >> 16),
+                               static_cast<char>(value >> 8), static_cast<char>(value)};
+        };
+        return bigEndian(static_cast<uint32_t>(chunk.size()) - 4) + chunk + bigEndian(crc);
+    }();
+    return mark;
+}
+
+bool WriteMarked(std::FILE* file, const AVPacket& png) {
+    const auto rest = static_cast<std::size_t>(png.size) - kPngHead;
+    return std::fwrite(png.data, 1, kPngHead, file) == kPngHead &&
+           std::fwrite(Mark().data(), 1, Mark().size(), file) == Mark().size() &&
+           std::fwrite(png.data + kPngHead, 1, rest, file) == rest;
+}
+
+FileId IdOf(std::FILE* file) {
+    struct stat status {};
+    fstat(fileno(file), &status);
+    return {status.st_dev, status.st_ino};
+}
 
 std::size_t Half(int size) {
     return static_cast<std::size_t>(size + 1) / 2;
@@ -80,28 +117,21 @@ std::FILE* CreateBeside(const std::string& path, std::string& temporary) {
     return file;
 }
 
-/// Empty on success, else what went wrong.
-std::string ReplaceFile(const std::string& path, const AVPacket& content) {
-    std::string temporary;
-    std::FILE* file = CreateBeside(path, temporary);
-    if (file == nullptr)
-        return std::strerror(errno);
-    const auto size = static_cast<std::size_t>(content.size);
-    std::string reason;
-    if (std::fwrite(content.data, 1, size, file) != size)
-        reason = std::strerror(errno);
-    if (std::fclose(file) != 0 && reason.empty())
-        reason = std::strerror(errno);
-    if (reason.empty() && std::rename(temporary.c_str(), path.c_str()) != 0)
-        reason = std::strerror(errno);
-    if (!reason.empty())
-        std::remove(temporary.c_str());
-    return reason;
-}
-
 } // namespace
 
-Preview::Preview(std::string path) : path_(std::move(path)), thread_(&Preview::Run, this) {}
+std::optional<FileId> CheckPreview(const std::string& path, bool overwrite) {
+    try {
+        const SideFile file = LookAtSideFile(path, Mark(), kPngHead);
+        RequireWritable(file, "--preview", path, "a preview", overwrite);
+        return file.kind == SideFile::Kind::kMissing ? std::nullopt : std::optional(file.id);
+    } catch (const std::system_error& error) {
+        throw Failure(ExitCode::kCannotWrite, fmt::format("--preview \"{}\" cannot be looked at: {}", path,
+                                                          std::strerror(error.code().value())));
+    }
+}
+
+Preview::Preview(std::string path, bool overwrite)
+    : path_(std::move(path)), replaceable_(CheckPreview(path_, overwrite)), thread_(&Preview::Run, this) {}
 
 Preview::~Preview() {
     Join();
@@ -163,6 +193,31 @@ void Preview::Run() {
     }
 }
 
+/// Empty on success, else what went wrong.
+std::string Preview::ReplaceFile(const AVPacket& content) {
+    std::string temporary;
+    std::FILE* file = CreateBeside(path_, temporary);
+    if (file == nullptr)
+        return std::strerror(errno);
+    const FileId written = IdOf(file);
+    std::string reason;
+    if (!WriteMarked(file, content))
+        reason = std::strerror(errno);
+    if (std::fclose(file) != 0 && reason.empty())
+        reason = std::strerror(errno);
+    if (reason.empty()) {
+        const int error = ReplaceExpected(temporary, path_, replaceable_);
+        reason = error == 0        ? ""
+                 : error == EEXIST ? "another file has come there meanwhile"
+                                   : std::strerror(error);
+    }
+    if (reason.empty())
+        replaceable_ = written;
+    else
+        std::remove(temporary.c_str());
+    return reason;
+}
+
 void Preview::Write(Picture& picture) {
     tagBITMAPINFOHEADER header{};
     header.biSize = sizeof header;
@@ -181,7 +236,7 @@ void Preview::Write(Picture& picture) {
 
     const av::Frame rgb = ToRgb(bgra, picture.width, picture.height);
     const av::Packet png = rgb ? EncodePng(*rgb) : nullptr;
-    std::string reason = png ? ReplaceFile(path_, *png) : "the picture could not be encoded";
+    std::string reason = png ? ReplaceFile(*png) : "the picture could not be encoded";
     if (failure_.empty())
         failure_ = std::move(reason);
 }

@@ -2,22 +2,32 @@
 #ifndef MOVIECONV_HOST_CONVERT_PREVIEW_H
 #define MOVIECONV_HOST_CONVERT_PREVIEW_H
 
+#include "host/convert/SideFile.h"
 #include "media/MediaRecords.h"
 
 #include <condition_variable>
 #include <cstdint>
 #include <mutex>
+#include <optional>
 #include <string>
 #include <thread>
 #include <vector>
 
+struct AVPacket;
+
 namespace movieconv {
 
+/// Throws Failure when a preview must not be written there: to what is no file or a symbolic link, and
+/// without `overwrite` to a file that is no preview. The file that is to be replaced; nothing when there is
+/// none.
+std::optional<FileId> CheckPreview(const std::string& path, bool overwrite);
+
 /// Writes at most once a second, on a thread of its own, to a temporary file that then takes the name. The
-/// last picture offered is always written.
+/// last picture offered is always written. What others put there meanwhile is left alone.
 class Preview {
 public:
-    explicit Preview(std::string path);
+    /// Checks as CheckPreview does.
+    Preview(std::string path, bool overwrite);
     Preview(const Preview&) = delete;
     Preview& operator=(const Preview&) = delete;
     ~Preview();
@@ -38,8 +48,10 @@ private:
     void Run();
     void Join();
     void Write(Picture& picture);
+    std::string ReplaceFile(const AVPacket& content);
 
     const std::string path_;
+    std::optional<FileId> replaceable_; // by the next picture
     std::mutex mutex_;
     std::condition_variable changed_;
     Picture latest_;

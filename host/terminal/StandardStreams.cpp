@@ -1,5 +1,6 @@
 #include "host/terminal/StandardStreams.h"
 
+#include "host/convert/SideFile.h"
 #include "host/terminal/ExitCode.h"
 #include "logsink/LogSink.h"
 #include "text/Utf8.h"
@@ -15,10 +16,19 @@ extern "C" {
 #include <fmt/format.h>
 #include <new>
 #include <sys/ioctl.h>
+#include <system_error>
 #include <unistd.h>
 
 namespace movieconv {
 namespace {
+
+constexpr std::string_view kLogHead = "movieconv log\n"; // by which a log is known again
+
+/// With the reason in errno.
+Failure CannotWriteLog(const std::string& path) {
+    return {ExitCode::kCannotWrite,
+            fmt::format("cannot write the log \"{}\": {}", path, std::strerror(errno))};
+}
 
 /// FFmpeg's messages, a line each, as they would be shown at its usual level.
 void LogFfmpeg(void* source, int level, const char* format, va_list arguments) {
@@ -35,20 +45,38 @@ void LogFfmpeg(void* source, int level, const char* format, va_list arguments) {
 
 } // namespace
 
-StandardStreams::StandardStreams(const std::optional<std::string>& logFile)
+StandardStreams::StandardStreams(const std::optional<std::string>& logFile, bool overwrite)
     : output_(fcntl(1, F_DUPFD_CLOEXEC, 3)) {
-    const char* path = logFile ? logFile->c_str() : "";
-    if (LogSinkSetFile(path) == 0) {
-        throw Failure(ExitCode::kCannotWrite,
-                      fmt::format("cannot write the log \"{}\": {}", *logFile, std::strerror(errno)));
-    }
-    const int log = open(logFile ? path : "/dev/null", O_WRONLY | O_APPEND | O_CREAT | O_CLOEXEC, 0666);
+    const int log = logFile ? OpenLog(*logFile, overwrite) : open("/dev/null", O_WRONLY | O_CLOEXEC);
     if (log >= 0) {
         std::fflush(stdout);
         dup2(log, 1);
         close(log);
     }
+    // By its descriptor: the name may stand for another file by now.
+    if (LogSinkSetFile(logFile ? "/proc/self/fd/1" : "") == 0)
+        throw CannotWriteLog(*logFile);
     av_log_set_callback(LogFfmpeg);
+}
+
+int StandardStreams::OpenLog(const std::string& path, bool overwrite) {
+    const auto require = [&](const SideFile& file) {
+        RequireWritable(file, "--log", path, "a log of movieconv", overwrite);
+    };
+    try {
+        require(LookAtSideFile(path, kLogHead, 0)); // before it is opened, which a device may notice
+        const int log =
+            open(path.c_str(), O_RDWR | O_APPEND | O_CREAT | O_NOFOLLOW | O_NONBLOCK | O_CLOEXEC, 0666);
+        if (log < 0)
+            throw CannotWriteLog(path);
+        require(LookAtSideFile(log, kLogHead, 0)); // another one may have come in between
+        if (lseek(log, 0, SEEK_END) == 0)
+            Write(log, kLogHead);
+        return log;
+    } catch (const std::system_error& error) {
+        errno = error.code().value();
+        throw CannotWriteLog(path);
+    }
 }
 
 void StandardStreams::PrintError(std::string_view text) const {

@@ -10,10 +10,11 @@
 namespace movieconv {
 
 /// Makes descriptor 1 the log file, or nothing without one, sends the log sink's and FFmpeg's lines the same
-/// way, and keeps the real standard output for Print. Throws Failure when the log file cannot be opened.
+/// way, and keeps the real standard output for Print. Throws Failure when the log file cannot be opened or
+/// must not be written to: a symbolic link, what is no file, and without `overwrite` a file that is no log.
 class StandardStreams {
 public:
-    explicit StandardStreams(const std::optional<std::string>& logFile);
+    StandardStreams(const std::optional<std::string>& logFile, bool overwrite);
     StandardStreams(const StandardStreams&) = delete;
     StandardStreams& operator=(const StandardStreams&) = delete;
 
@@ -30,6 +31,7 @@ public:
     int Columns() const;
 
 private:
+    static int OpenLog(const std::string& path, bool overwrite);
     static bool Write(int descriptor, std::string_view text);
 
     int output_;

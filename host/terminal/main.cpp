@@ -91,7 +91,7 @@ int Main(int argc, char** argv) {
         return static_cast<int>(ExitCode::kDone);
     CheckSideFiles(*options);
     ControlInput control;
-    const StandardStreams streams(options->log);
+    const StandardStreams streams(options->log, options->overwrite);
     try {
         return static_cast<int>(Perform(*options, streams, control));
     } catch (const SourceError& error) {

@@ -35,6 +35,15 @@ std::string Flashing() {
                 Join(FlashPictures(8), Beeps(8), Args{"-c:v", "libx264", "-bf", "2", "-c:a", "aac"}));
 }
 
+std::string Minute() {
+    return Make("minute.mkv", Join(CountedPictures(60), Beeps(60), kLossless));
+}
+
+/// Slow enough that a test can interfere: many large pictures, but none that a codec keeps for later.
+Args Slowly(const std::string& output) {
+    return {Minute(), output, "--size", "1280x960", "--frame-rate", "100"};
+}
+
 TEST(Program, WritesEveryPictureOnceAndAllSound) {
     const Folder folder;
     const Result result = Call({Counted(), folder / "out.mp4", "--video-rate", "2M"});
@@ -152,7 +161,7 @@ const Odd kOddities[] = {
     {"plain.mkv", Lossless(2, 2), "o.mkv", 2, 1.6, {"--length", "1.6", "--frame-rate", "1"}},
     {"plain.mkv", Lossless(2, 2), "o.webm", 26, 1, {"--begin", "0.5", "--length", "1"}},
     {"plain.mkv", Lossless(2, 2), "o.ts", 25, 2, kSmall},
-    {"plain.mkv", Lossless(2, 2), "o.mov", 50, 2, {"--log", "/dev/full"}}, // no harm
+    {"plain.mkv", Lossless(2, 2), "o.mov", 50, 2},
 };
 INSTANTIATE_TEST_SUITE_P(Sources, ProgramTakes, testing::ValuesIn(kOddities));
 
@@ -177,6 +186,7 @@ TEST(Program, RefusesAndLeavesEverythingAsItWas) {
     fs::copy_file(Counted(), source);
     fs::create_hard_link(source, folder / "same.mkv");
     fs::create_symlink("nothing.mkv", folder / "link.mkv");
+    fs::create_symlink("there.mp4", folder / "linked");
     WriteFile(folder / "there.mp4", "precious");
     WriteFile(folder / "clip_03.mp4", "precious");
     WriteFile(folder / "text.srt", "1\n00:00:00,000 --> 00:00:01,000\nWords alone.\n");
@@ -198,6 +208,12 @@ TEST(Program, RefusesAndLeavesEverythingAsItWas) {
         {{source, folder / "out.mkv", "--log", folder / "out.mkv.part"}, 2, "is the output"},
         {{source, folder / "clip.mkv", "--split", "1", "--log", folder / "clip_100.mkv"}, 2, "is the output"},
         {{source, folder / "out.mkv", "--log", folder / "x", "--preview", folder / "x"}, 2, "the same file"},
+        {{source, folder / "out.mkv", "--preview", folder / "there.mp4"}, 4, "not a preview"},
+        {{source, folder / "out.mkv", "--preview", folder / "linked", "-y"}, 4, "a symbolic link"},
+        {{source, folder / "out.mkv", "--preview", "/dev/null", "-y"}, 4, "a device"},
+        {{source, folder / "out.mkv", "--log", folder / "there.mp4"}, 4, "not a log"},
+        {{"--list-formats", "--log", folder / "link.mkv", "-y"}, 4, "a symbolic link"},
+        {{source, folder / "out.mkv", "--log", "/dev/full", "-y"}, 4, "a device"},
         {{source, folder / "link.mkv", "-y"}, 4, "a link to a missing file"},
         {{source, folder / "there.mp4"}, 4, "--overwrite"},
         {{source, folder / "clip.mp4", "--split", "1"}, 4, "clip_03.mp4"},
@@ -278,8 +294,26 @@ TEST(Program, KeepsAPreview) {
         ASSERT_EQ(seen.pictures.size(), 1u);
         EXPECT_EQ(seen.pictures[0].width, 160);
         EXPECT_NEAR(seen.pictures[0].luma, LumaOf(options.size() < 2 ? 99 : 12), 2);
-        fs::remove(folder / "now.png");
+        WriteFile(folder / "there.png", "precious"); // replaced by leave only, a preview of before without
+        EXPECT_EQ(Call({Counted(), folder / "out.mp4", "-y", "--preview", folder / "there.png"}).code, 0);
+        EXPECT_EQ(LookAt(folder / "there.png").pictures.size(), 1u);
     }
+
+    Running running(Join(Slowly(folder / "slow.mp4"),
+                         Args{"--length", "2", "--progress", "json", "--preview", folder / "now.png"}),
+                    false);
+    ASSERT_TRUE(running.WaitFor("clip_opened"));
+    running.Jam(); // so that it cannot come to an end before somebody else has put a file there
+    const auto before = fs::last_write_time(folder / "now.png");
+    while (fs::last_write_time(folder / "now.png") == before)
+        std::this_thread::sleep_for(std::chrono::milliseconds(5));
+    WriteFile(folder / "precious", "precious");
+    fs::rename(folder / "precious", folder / "now.png");
+    const Result result = running.Finish();
+    EXPECT_EQ(result.code, 0) << result.out;
+    EXPECT_NE(result.out.find("another file has come there meanwhile"), std::string::npos) << result.out;
+    EXPECT_EQ(ReadFile(folder / "now.png"), "precious");
+    EXPECT_EQ(folder.Names(), (Args{"now.png", "out.mp4", "slow.mp4", "there.png"}));
 
     const Result without =
         Call({Counted(), folder / "out.mkv", "--preview", folder / "nowhere/now.png", "--progress", "none"});
@@ -325,13 +359,22 @@ TEST(Program, GetsAlongWithWhateverStandardStreams) {
     EXPECT_EQ(shell("cat \"$0\" | movieconv --estimate /dev/stdin \"$1\"").code, 2);
 }
 
-std::string Minute() {
-    return Make("minute.mkv", Join(CountedPictures(60), Beeps(60), kLossless));
-}
-
-/// Slow enough that a test can interfere: many large pictures, but none that a codec keeps for later.
-Args Slowly(const std::string& output) {
-    return {Minute(), output, "--size", "1280x960", "--frame-rate", "100"};
+TEST(Program, AppendsToItsOwnLogsAndByLeaveToOthers) {
+    const Folder folder;
+    const auto call = [&](const std::string& log, const char* leave) {
+        return Call({Counted(), folder / "out.mp4", leave, "--length", "0.2", "--log", folder / log}).code;
+    };
+    WriteFile(folder / "empty", "");
+    WriteFile(folder / "letter", "Dear reader,\n");
+    EXPECT_EQ(call("log", "-q"), 0);
+    const std::string first = ReadFile(folder / "log");
+    for (const char* log : {"log", "empty", "letter"})
+        EXPECT_EQ(call(log, "-y"), 0);
+    EXPECT_EQ(ReadFile(folder / "log").find(first), 0u);
+    EXPECT_GT(ReadFile(folder / "log").size(), first.size());
+    EXPECT_EQ(ReadFile(folder / "empty").find("movieconv log\n"), 0u);
+    EXPECT_EQ(ReadFile(folder / "letter").find("Dear reader,\n"), 0u);
+    EXPECT_NE(ReadFile(folder / "letter").find("Encoding thread Exit."), std::string::npos);
 }
 
 class ProgramSignal : public testing::TestWithParam<int> {};
@@ -518,6 +561,18 @@ TEST(Program, KeepsWhatIsDoneOnAFullDiskRemovesItOrWaits) {
     const Result whole = waiting.Finish();
     EXPECT_EQ(whole.code, 0) << whole.out;
     EXPECT_EQ(LookAt(folder / "disk/out.mov").pictures.size(), 1500u);
+}
+
+TEST(Program, ConvertsAllAlthoughTheLogCannotBeWritten) {
+    const Folder folder;
+    const SmallDisk disk(folder / "disk");
+    if (!disk.IsThere())
+        GTEST_SKIP() << "no small disk can be mounted here";
+    WriteFile(folder / "disk/much", std::string(1'000'000, 'x'));
+    const Result result = Call({Counted(), folder / "out.mp4", "--log", folder / "disk/log"});
+    EXPECT_EQ(result.code, 0) << result.err;
+    EXPECT_EQ(LookAt(folder / "out.mp4").pictures.size(), 100u);
+    EXPECT_EQ(ReadFile(folder / "disk/log"), "");
 }
 
 } // namespace
