@@ -2,10 +2,14 @@
 
 #include "engine/ConvThread.h"
 #include "engine/Estimate.h"
+#include "engine/WriterCalls.h"
+#include "log/dyLog.h"
 
 #include <new>
 
 static_assert(MC_MAX_TARGET_NAME == kClipNameSize);
+static_assert(int{MC_LOG_ERROR} == int{kLogError} && int{MC_LOG_WARNING} == int{kLogWarning});
+static_assert(int{MC_LOG_INFO} == int{kLogInfo} && int{MC_LOG_DEBUG} == int{kLogDebug});
 static_assert(MC_INFINITE == kWaitInfinite && MC_WAIT_TIMEOUT == kWaitTimeout);
 
 namespace {
@@ -23,10 +27,46 @@ Result Call(MCHandle converter, Result failure, Operation operation) noexcept {
     }
 }
 
+/// Whether the media writer is one for this engine. One that does not tell its version has the five functions
+/// that every version calls.
+bool WriterFits() {
+    if (!Writer().getVersion)
+        return true;
+    const unsigned version = Writer().getVersion();
+    if (version >> 16 == MC_VERSION_MAJOR)
+        return true;
+    LogAt(kLogError, L"MovieConv::The media writer is of version %u.%u, this engine wants one of %u.\r\n",
+          version >> 16, version >> 8 & 0xFF, MC_VERSION_MAJOR);
+    return false;
+}
+
+/// True, with a line in the log, on the converter's own worker, which cannot wait for its own end.
+bool RefusedOnWorker(MCHandle converter, const wchar_t* function) {
+    if (!converter || !static_cast<ConvThread*>(converter)->IsWorker())
+        return false;
+    LogAt(kLogError,
+          L"MovieConv::%ls is refused on the converter's worker thread; there a callback returns 0 or calls "
+          L"MCAbort.\r\n",
+          function);
+    return true;
+}
+
 } // namespace
 
+unsigned MCGetVersion(void) {
+    return MC_VERSION;
+}
+
+int MCSetLogCallback(MCLogFunction function, void* user) {
+    if (LogRouteSet(function, user) == 0)
+        return 0;
+    if (Writer().forwardLog)
+        Writer().forwardLog(function ? 1 : 0);
+    return 1;
+}
+
 MCHandle MCCreate(VideoDecoder* video, AudioDecoder* audio) {
-    if (!video && !audio)
+    if ((!video && !audio) || !WriterFits())
         return nullptr;
     try {
         return new ConvThread(video, audio);
@@ -36,6 +76,8 @@ MCHandle MCCreate(VideoDecoder* video, AudioDecoder* audio) {
 }
 
 void MCDestroy(MCHandle converter) {
+    if (RefusedOnWorker(converter, L"MCDestroy"))
+        return;
     delete static_cast<ConvThread*>(converter);
 }
 
@@ -57,6 +99,10 @@ int MCSetSplitParam(MCHandle converter, int mode, unsigned long value) {
 
 unsigned MCEnablePreview(MCHandle converter, unsigned enable) {
     return Call(converter, 0U, [=](ConvThread& c) { return c.EnablePreview(enable); });
+}
+
+unsigned MCEnableEvents(MCHandle converter, unsigned enable) {
+    return Call(converter, 0U, [=](ConvThread& c) { return c.EnableEvents(enable); });
 }
 
 long long MCGetEstimateDiskSpace(MCHandle converter) {
@@ -86,6 +132,8 @@ int MCResume(MCHandle converter) {
 }
 
 int MCStop(MCHandle converter) {
+    if (RefusedOnWorker(converter, L"MCStop"))
+        return 0;
     return Call(converter, 0, [](ConvThread& c) { return c.Stop(0, 0); });
 }
 
@@ -94,6 +142,8 @@ int MCAbort(MCHandle converter) {
 }
 
 int MCWait(MCHandle converter, unsigned timeoutMs) {
+    if (RefusedOnWorker(converter, L"MCWait"))
+        return MC_WAIT_TIMEOUT;
     return Call(converter, -1, [=](ConvThread& c) { return static_cast<int>(c.Wait(timeoutMs)); });
 }
 

@@ -17,14 +17,17 @@
 /// Threads. A converter belongs to the host's thread that made it. MCPause, MCResume, MCAbort, MCStop,
 /// MCWait, MCEnablePreview, MCGetEncodeParam and the MCGet... queries may be called from any thread and at
 /// any time between MCCreate and MCDestroy; everything else while the converter does not run. The progress
-/// callback comes on the worker thread. It may call whatever does not wait for that thread: not MCStop,
-/// MCWait or MCDestroy.
+/// callback comes on the worker thread. It may call whatever does not wait for that thread: MCStop, MCWait
+/// and MCDestroy are refused there, with a line in the log. To end the conversion it returns 0 or calls
+/// MCAbort.
 ///
 /// Errors. A null handle does nothing and gives 0, from MCStart and MCWait -1. So does a lack of memory. No
 /// exception leaves these functions, and none may come out of a decoder or a callback.
 #ifndef MOVIECONV_API_MOVIECONV_H
 #define MOVIECONV_API_MOVIECONV_H
 
+#include "api/LogCallback.h"
+#include "api/Version.h"
 #include "engine/ProgressInfo.h"
 #include "media/EncodeParam.h"
 #include "media/FourCC.h"
@@ -55,14 +58,19 @@ enum {
 
 #pragma GCC visibility push(default)
 
+/// The version of the library that runs, as MC_MAKE_VERSION makes it.
+unsigned MCGetVersion(void);
+
 // ---- Making a converter
 
 /// Makes a converter for one opened movie. Either decoder may be null. The decoders stay the host's and must
 /// outlive the converter; what they describe becomes the default picture size, frame rate, sample rate and
-/// channel count. Null when both decoders are null or there is no memory.
+/// channel count. Null when both decoders are null or there is no memory, and with a line in the log when the
+/// media writer beside the engine is of another major version.
 MCHandle MCCreate(VideoDecoder* video, AudioDecoder* audio);
 
-/// Stops a running conversion, waits for its end and frees the converter. Null does nothing.
+/// Stops a running conversion, waits for its end and frees the converter. Null does nothing, and neither does
+/// a call inside the converter's own callback.
 void MCDestroy(MCHandle converter);
 
 // ---- Before a conversion
@@ -97,6 +105,10 @@ int MCSetSplitParam(MCHandle converter, int mode, unsigned long value);
 /// `enable`.
 unsigned MCEnablePreview(MCHandle converter, unsigned enable);
 
+/// Zero: the converter posts no events, for a host that goes by the callback alone and never receives any. On
+/// at first; takes effect at once, also while running. Returns `enable`.
+unsigned MCEnableEvents(MCHandle converter, unsigned enable);
+
 /// Size in bytes that the whole source is going to take with the parameters in force, for at most ten hours
 /// of it.
 long long MCGetEstimateDiskSpace(MCHandle converter);
@@ -129,14 +141,15 @@ int MCPause(MCHandle converter);
 /// call.
 int MCResume(MCHandle converter);
 
-/// Ends the conversion and waits for its end. What was written so far is closed as a file. Always 0.
+/// Ends the conversion and waits for its end. What was written so far is closed as a file. Always 0. Inside a
+/// callback or a decoder of this converter, on its worker thread, it is refused: nothing happens.
 int MCStop(MCHandle converter);
 
 /// Asks the conversion to end and does not wait. 1 when it was running or paused, else 0.
 int MCAbort(MCHandle converter);
 
 /// Waits at most `timeoutMs` milliseconds for the end of the conversion. 0 when it has ended or none was
-/// started, else MC_WAIT_TIMEOUT.
+/// started, else MC_WAIT_TIMEOUT. Refused on the converter's worker thread, with MC_WAIT_TIMEOUT at once.
 int MCWait(MCHandle converter, unsigned timeoutMs);
 
 /// Does nothing: the worker's priority is never changed. Always 0.

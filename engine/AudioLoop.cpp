@@ -39,7 +39,7 @@ int ConvThread::process_audio_only() {
 int ConvThread::AudioLoop::Run() {
     pAudioFormat = SourceFormat(converter.pAudioDecoder);
     if (!pAudioFormat || pAudioFormat->dDuration < kMinDuration) {
-        LogEx(L"MovieConv::Without audio decoder or zero length.");
+        LogAt(kLogError, L"MovieConv::Without audio decoder or zero length.");
         return ReportFailure();
     }
     if (!CreateFile(converter.strOutputFile.c_str()))

@@ -165,7 +165,7 @@ bool ConvThread::AudioVideoLoop::WriteSilence(const VideoImage* picture) {
     if (!silence) {
         silence.reset(new (std::nothrow) unsigned char[kSilenceSize]());
         if (!silence) {
-            LogEx(L"MovieConv::No memory for silence.\r\n");
+            LogAt(kLogError, L"MovieConv::No memory for silence.\r\n");
             return false;
         }
     }

@@ -36,13 +36,13 @@ wchar_t* ConvThread::CreateNewClip() {
     try {
         auto name = std::make_unique<wchar_t[]>(kClipNameSize);
         if (!FormatClipName(name.get(), strOutputFile, vecTargetNames.size())) {
-            LogEx(L"MovieConv::CreateNewClip(): output name too long for clips.\r\n");
+            LogAt(kLogError, L"MovieConv::CreateNewClip(): output name too long for clips.\r\n");
             return nullptr;
         }
         const CSingleLock guard(&sharedLock);
         return vecTargetNames.emplace_back(std::move(name)).get();
     } catch (const std::exception&) {
-        LogEx(L"MovieConv::CreateNewClip(): no memory for a clip name.\r\n");
+        LogAt(kLogError, L"MovieConv::CreateNewClip(): no memory for a clip name.\r\n");
         return nullptr;
     }
 }

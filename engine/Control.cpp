@@ -32,7 +32,7 @@ void LogDiskSpace(long long estimate, long long freeSpace, const wchar_t* output
     LogEx(L"MovieConv::Estimate Space[%lld Bytes];", estimate);
     LogEx(L"MovieConv::Disk Free Space[%lld Bytes];", freeSpace);
     if (freeSpace < estimate)
-        LogEx(L"Without enough Disk space to generate file[%ls].\r\n", outputFile);
+        LogAt(kLogWarning, L"Without enough Disk space to generate file[%ls].\r\n", outputFile);
 }
 
 } // namespace
@@ -55,7 +55,7 @@ int ConvThread::Start(double begin, double length, OpaqueWindowPtr* window, Prog
         dLength = 0.0;
     LogEx(L"MovieConv::StartThread(): ConvLength[%0.3fs]", dLength);
     if (pVideoDecoder && !SourceFormat(pVideoDecoder)) {
-        LogEx(L"Failed to open file.\r\n");
+        LogAt(kLogError, L"Failed to open file.\r\n");
         return kCannotOpenSource;
     }
 
@@ -73,7 +73,7 @@ int ConvThread::Start(double begin, double length, OpaqueWindowPtr* window, Prog
 
 int ConvThread::svc() {
     if (!pVideoDecoder && !pAudioDecoder) {
-        LogEx(L"MovieConv::decoder is null");
+        LogAt(kLogError, L"MovieConv::decoder is null");
         if (pfnProgress)
             pfnProgress(pProgressContext, 1, kOutcomeFailed, 0);
     } else if (encodeParam.bNoVideo || IsEmpty(pVideoDecoder)) {
@@ -100,6 +100,10 @@ void ConvThread::Drop(Decoder*& decoder, int32_t& bNoStream) {
 
 unsigned ConvThread::EnablePreview(unsigned enable) {
     return bPreview = enable;
+}
+
+unsigned ConvThread::EnableEvents(unsigned enable) {
+    return bEvents = enable;
 }
 
 int ConvThread::Pause() {

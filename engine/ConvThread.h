@@ -39,6 +39,7 @@ public:
     int SetOutputFile(const wchar_t* path);
     int SetSplitParam(int mode, unsigned long value);
     unsigned EnablePreview(unsigned enable);
+    unsigned EnableEvents(unsigned enable);
 
     int Start(double begin, double length, OpaqueWindowPtr* window, ProgressCallback callback, void* context);
     int Pause();
@@ -90,6 +91,8 @@ private:
     // and the parameters. The worker is the only one to write them while it runs, so its own reads do
     // without.
     mutable pthread_mutex_t sharedLock = PTHREAD_MUTEX_INITIALIZER;
+
+    std::atomic<uint32_t> bEvents{1};
 };
 
 #endif

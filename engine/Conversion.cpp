@@ -87,6 +87,10 @@ ProgressInfo ConvThread::Conversion::MakeProgressInfo(int32_t nProgress, uint32_
     return info;
 }
 
+int ConvThread::Conversion::Post(unsigned wParam, unsigned lParam) const {
+    return converter.bEvents ? PostMessage(converter.hProgressWnd, kProgressMessage, wParam, lParam) : 1;
+}
+
 bool ConvThread::Conversion::NotifyProgress(uint32_t now, VideoImage* preview) {
     const double progress = FiniteOrZero(10000.0 * dPosition / converter.dConvLength);
     const int32_t nProgress = std::min(Truncate<int32_t>(progress), kProgressComplete);
@@ -96,7 +100,7 @@ bool ConvThread::Conversion::NotifyProgress(uint32_t now, VideoImage* preview) {
     info.tRemaining = GetTimeData(static_cast<uint32_t>(remaining));
 
     const auto value = static_cast<unsigned>(nProgress);
-    PostMessage(converter.hProgressWnd, kProgressMessage, kMessageProgress, value);
+    Post(kMessageProgress, value);
     return converter.pfnProgress(converter.pProgressContext, 0, value, CallbackInfo(&info)) != 0;
 }
 
@@ -106,7 +110,7 @@ int ConvThread::Conversion::Finish(unsigned outcome, double doneLength) {
     ProgressInfo info = MakeProgressInfo(kProgressComplete, MillisecondClock() - tStart);
     info.dDoneLength = doneLength;
     if (outcome == kOutcomeCompleted) {
-        PostMessage(converter.hProgressWnd, kProgressMessage, kMessageProgress, kProgressComplete);
+        Post(kMessageProgress, kProgressComplete);
         if (converter.pfnProgress)
             converter.pfnProgress(converter.pProgressContext, 0, kProgressComplete, CallbackInfo(&info));
     }
@@ -118,7 +122,7 @@ int ConvThread::Conversion::ReportFailure() {
 }
 
 int ConvThread::Conversion::NotifyFinished(unsigned outcome, ProgressInfo* info) {
-    const int posted = PostMessage(converter.hProgressWnd, kProgressMessage, kMessageFinished, outcome);
+    const int posted = Post(kMessageFinished, outcome);
     if (!converter.pfnProgress)
         return posted;
     return static_cast<int>(

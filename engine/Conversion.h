@@ -68,6 +68,7 @@ protected:
 
 private:
     ProgressInfo MakeProgressInfo(int32_t nProgress, uint32_t elapsed) const;
+    int Post(unsigned wParam, unsigned lParam) const;
     int NotifyFinished(unsigned outcome, ProgressInfo* info);
 };
 

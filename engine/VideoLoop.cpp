@@ -63,7 +63,7 @@ int ConvThread::VideoLoop::Run() {
 
 // Unlike every other failure this one comes without an event.
 int ConvThread::VideoLoop::ReportNoPictures() {
-    const int logged = LogEx(L"MovieConv::Without video decoder.");
+    const int logged = LogAt(kLogError, L"MovieConv::Without video decoder.");
     if (!converter.pfnProgress)
         return logged;
     return static_cast<int>(converter.pfnProgress(converter.pProgressContext, 1, kOutcomeFailed, 0));

@@ -1,12 +1,14 @@
-// Logging: wide printf-style lines, handed to the function "Log" of the log sink library quennet.dylib, which
-// lies in the directory of the application's executable and is loaded with the first line. Without it, lines
-// are dropped.
+// Logging: wide printf-style lines. They go to the host's log function when it has set one
+// (platform/LogRoute.h), else to the function "Log" of the log sink library quennet.dylib, which lies in the
+// directory of the application's executable and is loaded with the first line. Without it, lines are dropped.
 //
-// Callers use LogEx and Log; the other four serve them. All are inline and exported, so that every unit that
-// logs shares one handle. They may be called from any thread and never fail toward the caller.
+// Callers use LogEx, Log and LogAt; the others serve them. The first two and what they stand on are inline
+// and exported, so that every unit that logs shares one handle. All may be called from any thread and never
+// fail toward the caller.
 #ifndef MOVIECONV_LOG_DYLOG_H
 #define MOVIECONV_LOG_DYLOG_H
 
+#include "platform/LogRoute.h"
 #include "platform/Platform.h"
 
 #include <cstdarg>
@@ -93,6 +95,17 @@ inline unsigned LowAddress(const void* address) {
     return static_cast<unsigned>(reinterpret_cast<std::uintptr_t>(address));
 }
 
+/// A line of the modules that do not log: to the host's log function, or as it stands to standard output.
+[[gnu::format(printf, 2, 3)]] inline void Say(int level, const char* format, ...) {
+    char line[640];
+    va_list arguments;
+    va_start(arguments, format);
+    std::vsnprintf(line, sizeof line, format, arguments);
+    va_end(arguments);
+    if (LogRouteTakeUtf8(level, line) == 0)
+        std::fputs(line, stdout);
+}
+
 } // namespace dylog
 
 /// Writes the directory of the application's executable, without a "/" at its end, into the `size` bytes of
@@ -110,7 +123,7 @@ DYLOG_EXPORT inline void* dyLogInit() {
         const bool complete = dylog::Append(path, sizeof path, "/quennet.dylib") && found;
         void* handle = complete ? dlopen(path, RTLD_LAZY) : nullptr;
         if (!handle)
-            std::printf("dyLog.h: dlopen [%s] error.\r\n", path);
+            dylog::Say(kLogError, "dyLog.h: dlopen [%s] error.\r\n", path);
         return handle;
     }();
     return hLogHandle;
@@ -125,29 +138,55 @@ DYLOG_EXPORT inline void* LogGetAddress(const char* name) {
         return address;
     const auto ordinal = reinterpret_cast<std::intptr_t>(name);
     if (ordinal > 65535)
-        std::printf("dyLog.h: LogGetAddress [%s] [0x%x] error.\r\n", name, dylog::LowAddress(handle));
+        dylog::Say(kLogError, "dyLog.h: LogGetAddress [%s] [0x%x] error.\r\n", name,
+                   dylog::LowAddress(handle));
     else
-        std::printf("dyLog.h: LogGetAddress [%d] [0x%x] error.\r\n", static_cast<int>(ordinal),
-                    dylog::LowAddress(handle));
+        dylog::Say(kLogError, "dyLog.h: LogGetAddress [%d] [0x%x] error.\r\n", static_cast<int>(ordinal),
+                   dylog::LowAddress(handle));
     return nullptr;
 }
 
-/// Hands `text` to the log sink as it stands. The sink's result, or 0 without a sink.
-DYLOG_EXPORT inline int Log(const wchar_t* text) {
+namespace dylog {
+
+/// Hands a line on; the host's function sees how much it matters, the sink has no room for that.
+inline int Put(int level, const wchar_t* text) {
+    if (LogRouteTake(level, text) != 0)
+        return 1;
     using LogEntry = int (*)(const wchar_t*);
     const auto entry = reinterpret_cast<LogEntry>(LogGetAddress("Log"));
     return entry ? entry(text) : 0;
 }
 
-/// Formats a line as wprintf does and hands it to the log sink; of a longer line the first 1023 characters.
-/// The sink's result, or 0 without a sink or for an empty line.
-DYLOG_EXPORT inline int LogEx(const wchar_t* fmt, ...) {
+inline int PutFormatted(int level, const wchar_t* fmt, va_list arguments) {
     wchar_t line[1024] = {};
+    return std::vswprintf(line, 1024, fmt, arguments) == 0 ? 0 : Put(level, line);
+}
+
+} // namespace dylog
+
+/// Hands `text` on as it stands. 1 when the host's log function took it, else the sink's result, or 0 without
+/// a sink.
+DYLOG_EXPORT inline int Log(const wchar_t* text) {
+    return dylog::Put(kLogInfo, text);
+}
+
+/// Formats a line as wprintf does and hands it on; of a longer line the first 1023 characters. The result is
+/// Log's, or 0 for an empty line.
+DYLOG_EXPORT inline int LogEx(const wchar_t* fmt, ...) {
     va_list arguments;
     va_start(arguments, fmt);
-    const int written = std::vswprintf(line, 1024, fmt, arguments);
+    const int result = dylog::PutFormatted(kLogInfo, fmt, arguments);
     va_end(arguments);
-    return written == 0 ? 0 : Log(line);
+    return result;
+}
+
+/// LogEx for a line that is more or less than information.
+inline int LogAt(int level, const wchar_t* fmt, ...) {
+    va_list arguments;
+    va_start(arguments, fmt);
+    const int result = dylog::PutFormatted(level, fmt, arguments);
+    va_end(arguments);
+    return result;
 }
 
 #undef DYLOG_EXPORT

@@ -1,5 +1,6 @@
 #include "logsink/LogSink.h"
 
+#include "api/Version.h"
 #include "text/Utf8.h"
 
 #include <algorithm>
@@ -76,4 +77,8 @@ int LogSinkSetFile(const char* utf8Path) {
         close(g_target);
     g_target = target;
     return 1;
+}
+
+unsigned LogSinkGetVersion(void) {
+    return MC_VERSION;
 }

@@ -1,5 +1,5 @@
 /// \file
-/// The log sink library, quennet.dylib: every line that it is given becomes one line of UTF-8. Both functions
+/// The log sink library, quennet.dylib: every line that it is given becomes one line of UTF-8. All functions
 /// may be called from any thread.
 #ifndef MOVIECONV_LOGSINK_LOGSINK_H
 #define MOVIECONV_LOGSINK_LOGSINK_H
@@ -21,6 +21,9 @@ int Log(const wchar_t* text);
 /// they are appended to the file of that name, which is created when it is missing. 1 on success; 0, with the
 /// lines going where they went before and the reason in errno, when the file cannot be opened.
 int LogSinkSetFile(const char* utf8Path);
+
+/// The sink's version, as MC_MAKE_VERSION makes it.
+unsigned LogSinkGetVersion(void);
 
 #pragma GCC visibility pop
 #ifdef __cplusplus

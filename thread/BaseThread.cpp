@@ -1,8 +1,8 @@
 #include "thread/BaseThread.h"
 
+#include "log/dyLog.h"
 #include "thread/SingleLock.h"
 
-#include <cstdio>
 #include <memory>
 #include <new>
 #include <utility>
@@ -23,15 +23,13 @@ pthread_t* _beginthreadex(void* /*security*/, unsigned /*stackSize*/, void* (*st
 
 namespace {
 
-/// What "%x" shows of an address: its low 32 bits.
-unsigned LowAddress(const void* address) {
-    return static_cast<unsigned>(reinterpret_cast<uintptr_t>(address));
-}
+/// Whose worker the calling thread is.
+thread_local const BaseThread* t_worker = nullptr;
 
 } // namespace
 
 BaseThread::BaseThread() {
-    printf("ThreadEngine::ThreadEngine() [0x%x]...\r\n", LowAddress(this));
+    dylog::Say(kLogDebug, "ThreadEngine::ThreadEngine() [0x%x]...\r\n", dylog::LowAddress(this));
     hStopEvent = SyncCreateEvent(nullptr, 1, 1, nullptr);
     hExitEvent = SyncCreateEvent(nullptr, 1, 1, nullptr);
 }
@@ -42,12 +40,16 @@ BaseThread::~BaseThread() {
     Join();
     nPauseCount = 0;
     nState = kStateIdle;
-    printf("ThreadEngine::~ThreadEngine() [0x%x]\r\n", LowAddress(this));
+    dylog::Say(kLogDebug, "ThreadEngine::~ThreadEngine() [0x%x]\r\n", dylog::LowAddress(this));
     SyncCloseEvent(hStopEvent);
     SyncCloseEvent(hExitEvent);
     hStopEvent = nullptr;
     hExitEvent = nullptr;
     pthread_mutex_destroy(&joinMutex);
+}
+
+bool BaseThread::IsWorker() const {
+    return t_worker == this;
 }
 
 bool BaseThread::IsActive() const {
@@ -92,6 +94,7 @@ void* BaseThread::thread_func(void* arg) {
     if (!arg)
         return nullptr;
     auto* self = static_cast<BaseThread*>(arg);
+    t_worker = self;
     self->svc();
     if (self->hExitEvent)
         self->hExitEvent->SetEvent();
@@ -117,11 +120,11 @@ int BaseThread::Abort() {
 unsigned BaseThread::Wait(unsigned timeoutMs) {
     if (!IsActive())
         return kWaitSignalled;
-    puts("ThreadEngine::Wait() ...\r");
+    dylog::Say(kLogDebug, "ThreadEngine::Wait() ...\r\n");
     const unsigned result = hExitEvent ? hExitEvent->Wait(timeoutMs) : kWaitSignalled;
     if (result != kWaitTimeout)
         Join();
-    puts("ThreadEngine::Wait() S_OK\r");
+    dylog::Say(kLogDebug, "ThreadEngine::Wait() S_OK\r\n");
     return result;
 }
 

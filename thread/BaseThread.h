@@ -32,6 +32,9 @@ public:
     /// Waits for the worker's end and joins it. kWaitSignalled, also when nothing runs, or kWaitTimeout.
     unsigned Wait(unsigned timeoutMs);
 
+    /// True on the worker itself, which nobody may wait for there.
+    bool IsWorker() const;
+
 protected:
     /// The worker's body; the result is not used. The default polls until it is told to stop.
     virtual int svc();

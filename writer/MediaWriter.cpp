@@ -1,6 +1,7 @@
 // The five functions of the media writer and the functions of its status header: no exception leaves them.
 #include "media/MediaWriter.h"
 
+#include "api/Version.h"
 #include "text/Utf8.h"
 #include "writer/FormatTable.h"
 #include "writer/MediaFile.h"
@@ -105,4 +106,8 @@ int MWGetFileStatus(int sequence, WriterStatus* status) {
 
 int MWGetLastFailure(WriterStatus* status) {
     return Guarded(0, [&] { return CopyStatus(StatusBoard::Instance().LastFailure(), status); });
+}
+
+unsigned MWGetVersion(void) {
+    return MC_VERSION;
 }

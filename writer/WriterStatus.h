@@ -136,6 +136,13 @@ int MWGetFileStatus(int sequence, WriterStatus* status);
 /// `status` is null.
 int MWGetLastFailure(WriterStatus* status);
 
+/// The writer's version, as MC_MAKE_VERSION makes it. An engine of another major version refuses the writer.
+unsigned MWGetVersion(void);
+
+/// Nonzero: FFmpeg's lines go to the log function that the engine has been given, from all of the process's
+/// uses of its libraries. Zero: they are shown as FFmpeg does it by itself. The engine calls this.
+void MWForwardLog(int forward);
+
 #pragma GCC visibility pop
 #ifdef __cplusplus
 }

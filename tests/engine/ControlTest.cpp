@@ -151,4 +151,31 @@ TEST(DispatchTest, ChoosesTheLoopByTheStreams) {
     }
 }
 
+TEST(CallbackTest, WaitingForItsOwnThreadIsRefused) {
+    ScriptedHost host;
+    host.SetMovie(2, 4);
+    host.onCallback = [&host](unsigned kind, const ProgressInfo*) {
+        if (kind == 0 && host.records.size() == 1) {
+            EXPECT_EQ(MCStop(host.handle), 0);
+            EXPECT_EQ(MCWait(host.handle, MC_INFINITE), MC_WAIT_TIMEOUT);
+            MCDestroy(host.handle);
+        }
+    };
+    EXPECT_NE(host.Convert().find("finished 0"), std::string::npos) << "the conversion went on to its end";
+    const std::string log = Trace(Part::kLog);
+    for (const char* function : {"MCStop", "MCWait", "MCDestroy"})
+        EXPECT_NE(log.find(std::string("MovieConv::") + function + " is refused"), std::string::npos) << log;
+}
+
+TEST(EventTest, NoneIsPostedForAHostThatWantsNone) {
+    ScriptedHost host;
+    host.SetMovie(2, 4);
+    host.Create();
+    EXPECT_EQ(MCEnableEvents(host.handle, 0), 0U);
+    const std::string trace = host.Convert();
+    EXPECT_EQ(trace.find("event"), std::string::npos) << trace;
+    EXPECT_NE(trace.find("finished 0"), std::string::npos) << trace;
+    EXPECT_EQ(MCEnableEvents(host.handle, 7), 7U);
+}
+
 } // namespace
