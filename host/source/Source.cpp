@@ -5,7 +5,6 @@
 #include <algorithm>
 #include <cmath>
 #include <new>
-#include <system_error>
 #include <vector>
 
 extern "C" {
@@ -22,18 +21,9 @@ constexpr double kGuessedDuration = 3600;  // for sources that tell nothing at a
 constexpr int64_t kStretchBytes = 2 << 20; // read at the end, and at the beginning, to find the duration
 constexpr double kClockStart = 8;       // a stamp below, far into the file, may count on from what was probed
 constexpr double kUsualFrameRate = 200; // a higher one may be an artefact of the container's clock
-constexpr double kHighestPeakRate = 240;          // likewise where pictures follow each other closest
-constexpr int kCountedPictures = 250;             // to find out how many there are in a second
-constexpr double kFallbackFrameRate = 25;         // pictures keep their own times whatever rate is told
-constexpr char kProtocols[] = "file,crypto,data"; // a playlist names files, but never opens the network
-
-int WasInterrupted(void* file) {
-    return static_cast<const InputFile*>(file)->Interrupted() ? 1 : 0;
-}
-
-std::string CannotOpen(const std::string& path, const std::string& reason) {
-    return "cannot open \"" + path + "\": " + reason;
-}
+constexpr double kHighestPeakRate = 240;  // likewise where pictures follow each other closest
+constexpr int kCountedPictures = 250;     // to find out how many there are in a second
+constexpr double kFallbackFrameRate = 25; // pictures keep their own times whatever rate is told
 
 bool IsTold(AVRational rate) {
     return rate.num > 0 && rate.den > 0;
@@ -114,43 +104,10 @@ Source::Source(const std::string& path, SourceChoice choice) : choice_(choice) {
 
 /// Opens the file, again if it is open, and chooses its streams.
 void Source::Open() {
-    const std::string& path = info_.path;
-    input_.reset();
-    try {
-        file_ = std::make_unique<InputFile>(path);
-    } catch (const std::system_error& error) {
-        throw SourceError(CannotOpen(path, error.code().message()));
-    }
-    info_.bytes = file_->Size();
-    // The prefix keeps a colon in the name from being read as a protocol.
-    const std::string url = "file:" + path;
-    AVDictionary* settings = nullptr;
-    const bool isSet = av_dict_set(&settings, "protocol_whitelist", kProtocols, 0) >= 0 &&
-                       av_dict_set(&settings, "pattern_type", "none", 0) >= 0; // "%d" in a name is no pattern
-    AVFormatContext* context = isSet ? avformat_alloc_context() : nullptr;
-    if (context == nullptr) {
-        av_dict_free(&settings);
-        throw std::bad_alloc();
-    }
-    context->pb = file_->Io();
-    context->interrupt_callback = {WasInterrupted, file_.get()}; // for files that the source names
-    const int result = avformat_open_input(&context, url.c_str(), nullptr, &settings);
-    av_dict_free(&settings);
-    av::CheckMemory(result);
-    if (result < 0) {
-        const std::string hint =
-            result == AVERROR_INVALIDDATA
-                ? "it is not a movie, or its index is missing because it was never finished"
-                : av::ErrorText(result);
-        throw SourceError(CannotOpen(path, hint));
-    }
-    input_.reset(context);
-    if (av_match_name("tty", context->iformat->name) != 0) // which draws letters as pictures
-        throw SourceError(CannotOpen(path, "it is a text, not a movie"));
-    const int found = avformat_find_stream_info(context, nullptr);
-    av::CheckMemory(found);
-    if (found < 0)
-        throw SourceError("cannot read the streams of \"" + path + "\": " + av::ErrorText(found));
+    file_.reset();
+    file_ = std::make_unique<MovieFile>(info_.path, choice_.playlists);
+    info_.bytes = file_->Bytes();
+    const AVFormatContext* context = Context();
     if (context->start_time != AV_NOPTS_VALUE)
         start_ = av_rescale_q(context->start_time, {1, AV_TIME_BASE}, {1, kTicksPerSecond});
     info_.container =
@@ -159,22 +116,22 @@ void Source::Open() {
 }
 
 void Source::ChooseStreams() {
-    for (unsigned i = 0; i < input_->nb_streams; ++i)
-        input_->streams[i]->discard = AVDISCARD_ALL;
+    for (unsigned i = 0; i < Context()->nb_streams; ++i)
+        Context()->streams[i]->discard = AVDISCARD_ALL;
     if (choice_.pictures) {
-        const int index = av_find_best_stream(input_.get(), AVMEDIA_TYPE_VIDEO, -1, -1, nullptr, 0);
+        const int index = av_find_best_stream(Context(), AVMEDIA_TYPE_VIDEO, -1, -1, nullptr, 0);
         const bool isCover =
-            index >= 0 && (input_->streams[index]->disposition & AV_DISPOSITION_ATTACHED_PIC) != 0;
+            index >= 0 && (Context()->streams[index]->disposition & AV_DISPOSITION_ATTACHED_PIC) != 0;
         if (index >= 0 && !isCover &&
-            avcodec_find_decoder(input_->streams[index]->codecpar->codec_id) != nullptr)
+            avcodec_find_decoder(Context()->streams[index]->codecpar->codec_id) != nullptr)
             DescribePictures(index);
     }
     if (choice_.sound) {
-        const int index = av_find_best_stream(input_.get(), AVMEDIA_TYPE_AUDIO, -1,
+        const int index = av_find_best_stream(Context(), AVMEDIA_TYPE_AUDIO, -1,
                                               info_.pictures ? info_.pictures->index : -1, nullptr, 0);
-        if (index >= 0 && avcodec_find_decoder(input_->streams[index]->codecpar->codec_id) != nullptr &&
-            input_->streams[index]->codecpar->sample_rate > 0 &&
-            input_->streams[index]->codecpar->ch_layout.nb_channels > 0)
+        if (index >= 0 && avcodec_find_decoder(Context()->streams[index]->codecpar->codec_id) != nullptr &&
+            Context()->streams[index]->codecpar->sample_rate > 0 &&
+            Context()->streams[index]->codecpar->ch_layout.nb_channels > 0)
             DescribeSound(index);
     }
     if (!info_.pictures && !info_.sound) {
@@ -187,7 +144,7 @@ void Source::ChooseStreams() {
 }
 
 void Source::DescribePictures(int index) {
-    AVStream* stream = input_->streams[index];
+    AVStream* stream = Context()->streams[index];
     const AVCodecParameters* parameters = stream->codecpar;
     if (parameters->width <= 0 || parameters->height <= 0)
         return;
@@ -201,7 +158,7 @@ void Source::DescribePictures(int index) {
     const bool turned = info.quarterTurns % 2 != 0;
     info.width = turned ? parameters->height : parameters->width;
     info.height = turned ? parameters->width : parameters->height;
-    info.pixelAspect = PixelAspect(input_.get(), stream, turned);
+    info.pixelAspect = PixelAspect(Context(), stream, turned);
     info.frameRate = ToldFrameRate(stream);
     info.duration = EndOf(stream);
     info.interlaced = parameters->field_order > AV_FIELD_PROGRESSIVE;
@@ -212,7 +169,7 @@ void Source::DescribePictures(int index) {
 }
 
 void Source::DescribeSound(int index) {
-    AVStream* stream = input_->streams[index];
+    AVStream* stream = Context()->streams[index];
     const AVCodecParameters* parameters = stream->codecpar;
     stream->discard = AVDISCARD_DEFAULT;
     SoundStreamInfo info;
@@ -243,8 +200,9 @@ double Source::EndOf(const AVStream* stream) const {
 /// Pictures per second by the container's index, or by the stamps of the first ones; 0 when neither can be
 /// read.
 double Source::CountFrameRate() {
-    AVStream* stream = input_->streams[info_.pictures->index];
-    if (av_match_name("mov", input_->iformat->name) != 0 && stream->nb_frames > 1 && stream->duration > 0) {
+    AVStream* stream = Context()->streams[info_.pictures->index];
+    if (av_match_name("mov", Context()->iformat->name) != 0 && stream->nb_frames > 1 &&
+        stream->duration > 0) {
         const double indexed = static_cast<double>(stream->nb_frames) /
                                (static_cast<double>(stream->duration) * av_q2d(stream->time_base));
         if (IsAbout(stream->avg_frame_rate, indexed, 0.05))
@@ -252,7 +210,7 @@ double Source::CountFrameRate() {
     }
     if (!IsSeekable())
         return 0;
-    AVStream* sound = info_.sound ? input_->streams[info_.sound->index] : nullptr;
+    AVStream* sound = info_.sound ? Context()->streams[info_.sound->index] : nullptr;
     if (sound != nullptr)
         sound->discard = AVDISCARD_ALL;
     const Stretch begin = ReadStretch(8 * kStretchBytes, kCountedPictures);
@@ -282,12 +240,12 @@ void Source::FindFrameRate() {
 }
 
 void Source::FindDuration() {
-    const bool guessedByRate = input_->duration_estimation_method == AVFMT_DURATION_FROM_BITRATE;
-    info_.duration = input_->duration > 0 ? static_cast<double>(input_->duration) / AV_TIME_BASE : 0;
-    if (info_.duration > 0 && AnnouncesItsEnd(*input_->iformat))
+    const bool guessedByRate = Context()->duration_estimation_method == AVFMT_DURATION_FROM_BITRATE;
+    info_.duration = Context()->duration > 0 ? static_cast<double>(Context()->duration) / AV_TIME_BASE : 0;
+    if (info_.duration > 0 && AnnouncesItsEnd(*Context()->iformat))
         info_.duration -= ToSeconds(start_);
     // ASF has its length from whoever wrote it, who may have taken the last stamp for it.
-    const bool doubtful = av_match_name("asf", input_->iformat->name) != 0 && start_ > kTicksPerSecond;
+    const bool doubtful = av_match_name("asf", Context()->iformat->name) != 0 && start_ > kTicksPerSecond;
     const bool measured = info_.duration <= 0 || guessedByRate || doubtful;
     if (measured)
         MeasureDuration();
@@ -314,10 +272,10 @@ void Source::MeasureDuration() {
     bool countsOn = true;
     if (IsSeekable()) {
         const int64_t target = std::max<int64_t>(info_.bytes - kStretchBytes, 0);
-        const bool byBytes = (input_->iformat->flags & AVFMT_NO_BYTE_SEEK) == 0;
+        const bool byBytes = (Context()->iformat->flags & AVFMT_NO_BYTE_SEEK) == 0;
         const int sought =
-            byBytes ? avformat_seek_file(input_.get(), -1, INT64_MIN, target, INT64_MAX, AVSEEK_FLAG_BYTE)
-                    : avformat_seek_file(input_.get(), -1, INT64_MIN, INT64_MAX / 2, INT64_MAX, 0);
+            byBytes ? avformat_seek_file(Context(), -1, INT64_MIN, target, INT64_MAX, AVSEEK_FLAG_BYTE)
+                    : avformat_seek_file(Context(), -1, INT64_MIN, INT64_MAX / 2, INT64_MAX, 0);
         if (sought >= 0)
             tail = ReadStretch(INT64_MAX);
         countsOn = !byBytes || target == 0 || tail.first > kClockStart;
@@ -345,16 +303,16 @@ void Source::MeasureDuration() {
 /// describe the streams anew, as they are there; for the decoders they are as at the beginning.
 Source::Stretch Source::ReadStretch(int64_t mostBytes, int mostPackets) {
     std::vector<av::CodecParameters> beginnings;
-    for (unsigned i = 0; i < input_->nb_streams; ++i) {
+    for (unsigned i = 0; i < Context()->nb_streams; ++i) {
         beginnings.emplace_back(avcodec_parameters_alloc());
-        CopyParameters(*input_->streams[i]->codecpar, beginnings[i].get());
+        CopyParameters(*Context()->streams[i]->codecpar, beginnings[i].get());
     }
     const int counted = info_.pictures ? info_.pictures->index : info_.sound->index;
     Stretch stretch;
     const av::Packet packet = av::NewPacket();
     while (stretch.bytes < mostBytes && stretch.packets < mostPackets &&
-           av_read_frame(input_.get(), packet.get()) >= 0) {
-        const AVStream* stream = input_->streams[packet->stream_index];
+           av_read_frame(Context(), packet.get()) >= 0) {
+        const AVStream* stream = Context()->streams[packet->stream_index];
         stretch.bytes += packet->size;
         if (packet->stream_index == counted) {
             ++stretch.packets;
@@ -369,7 +327,7 @@ Source::Stretch Source::ReadStretch(int64_t mostBytes, int mostPackets) {
         av_packet_unref(packet.get());
     }
     for (std::size_t i = 0; i < beginnings.size(); ++i)
-        CopyParameters(*beginnings[i], input_->streams[i]->codecpar);
+        CopyParameters(*beginnings[i], Context()->streams[i]->codecpar);
     return stretch;
 }
 
@@ -379,14 +337,14 @@ void Source::ReturnToBegin() {
 }
 
 bool Source::IsSeekable() const {
-    return input_->pb != nullptr && (input_->pb->seekable & AVIO_SEEKABLE_NORMAL) != 0;
+    return Context()->pb != nullptr && (Context()->pb->seekable & AVIO_SEEKABLE_NORMAL) != 0;
 }
 
 bool Source::Rewind() {
-    const int flags = input_->iformat->flags;
+    const int flags = Context()->iformat->flags;
     const auto toFirstByte = [&] {
         return (flags & AVFMT_NO_BYTE_SEEK) == 0 &&
-               avformat_seek_file(input_.get(), -1, 0, 0, 0, AVSEEK_FLAG_BYTE) >= 0;
+               avformat_seek_file(Context(), -1, 0, 0, 0, AVSEEK_FLAG_BYTE) >= 0;
     };
     // In streams for broadcast the first time lies behind the first key picture, which is decoded earlier.
     if ((flags & AVFMT_TS_DISCONT) != 0 && toFirstByte())
@@ -398,15 +356,15 @@ bool Source::Rewind() {
         first = sound;
     const int64_t start = first->start_time != AV_NOPTS_VALUE ? first->start_time : 0;
     const int64_t earlier = start - av_rescale_q(1, {1, 1}, first->time_base);
-    return avformat_seek_file(input_.get(), first->index, INT64_MIN, earlier, start, 0) >= 0 || toFirstByte();
+    return avformat_seek_file(Context(), first->index, INT64_MIN, earlier, start, 0) >= 0 || toFirstByte();
 }
 
 const AVStream* Source::PictureStream() const {
-    return info_.pictures ? input_->streams[info_.pictures->index] : nullptr;
+    return info_.pictures ? Context()->streams[info_.pictures->index] : nullptr;
 }
 
 const AVStream* Source::SoundStream() const {
-    return info_.sound ? input_->streams[info_.sound->index] : nullptr;
+    return info_.sound ? Context()->streams[info_.sound->index] : nullptr;
 }
 
 int64_t Source::MediaTime(int64_t stamp, const AVStream* stream) const {

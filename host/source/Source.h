@@ -3,23 +3,16 @@
 #define MOVIECONV_HOST_SOURCE_SOURCE_H
 
 #include "ffmpeg/AvHandles.h"
-#include "host/source/InputFile.h"
+#include "host/source/MovieFile.h"
+#include "host/source/SourceError.h"
 
 #include <cstdint>
 #include <limits>
 #include <memory>
 #include <optional>
-#include <stdexcept>
 #include <string>
 
 namespace movieconv {
-
-/// The source cannot be opened or holds nothing that can be converted. The text names the file and the
-/// reason.
-class SourceError : public std::runtime_error {
-public:
-    using std::runtime_error::runtime_error;
-};
 
 /// How a duration was found: told by the source, reckoned from its size and parts of it, or not at all.
 enum class Certainty { kKnown, kEstimated, kGuessed };
@@ -64,21 +57,22 @@ struct SourceInfo {
 };
 
 struct SourceChoice {
-    bool pictures = true; ///< Look for pictures at all.
-    bool sound = true;    ///< Look for sound at all.
+    bool pictures = true;   ///< Look for pictures at all.
+    bool sound = true;      ///< Look for sound at all.
+    bool playlists = false; ///< Also open what names other movies, in its own folder and below.
 };
 
 /// An opened movie. One thread at a time reads from it; Interrupt may be called from any.
 class Source {
 public:
     /// Opens `path` (bytes as the system has them) and finds the first stream of pictures and of sound that
-    /// can be decoded. Throws SourceError.
+    /// can be decoded. Throws SourceError, PlaylistError for a playlist that was not allowed.
     Source(const std::string& path, SourceChoice choice);
     Source(const Source&) = delete;
     Source& operator=(const Source&) = delete;
 
     const SourceInfo& Info() const { return info_; }
-    AVFormatContext* Context() const { return input_.get(); }
+    AVFormatContext* Context() const { return file_->Context(); }
     const AVStream* PictureStream() const;
     const AVStream* SoundStream() const;
 
@@ -119,8 +113,7 @@ private:
     void ReturnToBegin();
 
     const SourceChoice choice_;
-    std::unique_ptr<InputFile> file_;
-    av::Input input_;
+    std::unique_ptr<MovieFile> file_;
     int64_t start_ = 0; // the container's first stamp, in media time
     SourceInfo info_;
 };

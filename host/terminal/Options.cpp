@@ -115,6 +115,10 @@ void AddRange(CLI::App& app, Options& options) {
               "Write clips of this length: OUTPUT_00, OUTPUT_01, ...")
         ->type_name("TIME")
         ->group(group);
+    app.add_flag("--allow-playlists", options.playlists,
+                 "Also read playlists, which may name movies in their\nfolder and below; by default they are "
+                 "refused")
+        ->group(group);
 }
 
 void AddOutput(CLI::App& app, Options& options) {

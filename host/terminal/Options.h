@@ -35,6 +35,7 @@ struct Options {
     std::optional<int32_t> sampleRate;
     bool noVideo = false;
     bool noAudio = false;
+    bool playlists = false; ///< The input may be a playlist.
 
     double begin = 0;             ///< Seconds.
     std::optional<double> length; ///< Seconds.

@@ -66,7 +66,8 @@ ExitCode Estimate(const Options& options, Movie& movie, const StandardStreams& s
 }
 
 ExitCode Perform(const Options& options, const StandardStreams& streams, ControlInput& control) {
-    const SourceChoice choice{.pictures = !options.noVideo, .sound = !options.noAudio};
+    const SourceChoice choice{
+        .pictures = !options.noVideo, .sound = !options.noAudio, .playlists = options.playlists};
     if (options.task == Task::kListFormats) {
         PrintWhole(streams, ListFormats());
         return ExitCode::kDone;
@@ -94,6 +95,8 @@ int Main(int argc, char** argv) {
     const StandardStreams streams(options->log, options->overwrite);
     try {
         return static_cast<int>(Perform(*options, streams, control));
+    } catch (const PlaylistError& error) {
+        throw Failure(ExitCode::kCannotRead, fmt::format("{}; see --allow-playlists", error.what()));
     } catch (const SourceError& error) {
         throw Failure(ExitCode::kCannotRead, error.what());
     }

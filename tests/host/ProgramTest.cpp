@@ -191,6 +191,7 @@ TEST(Program, RefusesAndLeavesEverythingAsItWas) {
     WriteFile(folder / "clip_03.mp4", "precious");
     WriteFile(folder / "text.srt", "1\n00:00:00,000 --> 00:00:01,000\nWords alone.\n");
     WriteFile(folder / "text.ans", "Words alone.\n");
+    WriteFile(folder / "text.ffconcat", "ffconcat version 1.0\nfile in.mkv\n");
     WriteFile(folder / "network.sdp", "v=0\nc=IN IP4 127.0.0.1\nm=video 5004 RTP/AVP 33\n");
     const std::string whole = ReadFile(
         Make("index-first.mp4", Join(CountedPictures(1), Beeps(1), Args{"-movflags", "+faststart"})));
@@ -238,7 +239,8 @@ TEST(Program, RefusesAndLeavesEverythingAsItWas) {
         {{folder / "there.mp4", folder / "out.mp4"}, 3, "there.mp4"},
         {{folder / "text.srt", folder / "out.mp4"}, 3, "no pictures and no sound"},
         {{folder / "text.ans", folder / "out.mp4"}, 3, "it is a text"},
-        {{folder / "network.sdp", folder / "out.mp4"}, 3, "not a movie"},
+        {{folder / "network.sdp", folder / "out.mp4"}, 3, "where to find one"},
+        {{folder / "text.ffconcat", folder / "out.mp4"}, 3, "--allow-playlists"},
         {{folder / "head.mp4", folder / "there.mp4", "-y"}, 3, "nothing to convert"},
         {{source, folder / "out.mp4", "--begin", "9"}, 2, "--begin"},
         {{source, folder / "out.mp4", "--fit", "wide"}, 2, "\"wide\" is not borders|stretch"},

@@ -1,0 +1,108 @@
+#include "host/source/MovieFile.h"
+
+#include "host/source/ConcatScript.h"
+#include "host/source/SourceError.h"
+
+#include <new>
+#include <system_error>
+
+extern "C" {
+#include <libavutil/avstring.h>
+}
+
+namespace movieconv {
+namespace {
+
+constexpr char kPlaylists[] = "hls,dash,concat,imf,sdp,vobsub"; // name other files
+constexpr char kFollowed[] = "hls,concat"; // let each of them be looked at before it is opened
+// What a playlist may name: containers and bare streams of pictures and sound, nothing that turns a text into
+// pictures, and no further playlist.
+constexpr char kParts[] = "aac,ac3,aiff,asf,avi,caf,dts,dv,eac3,flac,flv,h264,hevc,ivf,m4v,matroska,mov,mp3,"
+                          "mpeg,mpegts,mpegvideo,mxf,nut,obu,ogg,truehd,vc1,w64,wav";
+constexpr char kNoProtocol[] = "none"; // an empty list would allow all
+
+bool IsOneOf(const AVInputFormat& format, const char* names) {
+    return av_match_name(format.name, names) != 0 || av_match_list(format.name, names, ',') > 0;
+}
+
+int WasInterrupted(void* file) {
+    return static_cast<const InputFile*>(file)->Interrupted() ? 1 : 0;
+}
+
+std::string CannotOpen(const std::string& path, const std::string& reason) {
+    return "cannot open \"" + path + "\": " + reason;
+}
+
+std::string ReasonOf(int error) {
+    return error == AVERROR_INVALIDDATA
+               ? "it is not a movie, or its index is missing because it was never finished"
+               : av::ErrorText(error);
+}
+
+} // namespace
+
+MovieFile::MovieFile(const std::string& path, bool playlists) try
+    : path_(path), companions_(path, playlists), bytes_(path) {
+    // The prefix keeps a colon in the name from being read as a protocol.
+    const std::string url = "file:" + path;
+    Open(url, Recognise(url, playlists));
+} catch (const std::system_error& error) {
+    throw SourceError(CannotOpen(path, error.code().message()));
+}
+
+bool MovieFile::IsPlaylist() const {
+    return IsOneOf(*input_->iformat, kPlaylists);
+}
+
+/// The format by what the file holds, and whether it is one that may be read.
+const AVInputFormat& MovieFile::Recognise(const std::string& url, bool playlists) {
+    const AVInputFormat* format = nullptr;
+    const int result = av_probe_input_buffer2(bytes_.Io(), &format, url.c_str(), nullptr, 0, 0);
+    av::CheckMemory(result);
+    if (result < 0)
+        throw SourceError(CannotOpen(path_, ReasonOf(result)));
+    if (av_match_name("tty", format->name) != 0) // which draws letters as pictures
+        throw SourceError(CannotOpen(path_, "it is a text, not a movie"));
+    if (IsOneOf(*format, kPlaylists)) {
+        if (!IsOneOf(*format, kFollowed))
+            throw SourceError(CannotOpen(path_, "it is not a movie, but says where to find one"));
+        if (!playlists)
+            throw PlaylistError(CannotOpen(path_, "it is a playlist, which names other files"));
+    }
+    return *format;
+}
+
+void MovieFile::Open(const std::string& url, const AVInputFormat& format) {
+    av::Options settings;
+    settings.Set("pattern_type", "none"); // "%d" in a name is no pattern
+    settings.Set("protocol_whitelist", kNoProtocol);
+    if (IsOneOf(format, kPlaylists))
+        settings.Set("format_whitelist", (std::string(kParts) + "," + format.name).c_str());
+    if (av_match_name("concat", format.name) != 0) { // the one that opens files without asking
+        CheckConcatScript(bytes_, path_, companions_, kParts);
+        settings.Set("protocol_whitelist", "file");
+        settings.Set("safe", "0");
+    }
+    AVFormatContext* context = avformat_alloc_context();
+    if (context == nullptr)
+        throw std::bad_alloc();
+    context->pb = bytes_.Io();
+    context->interrupt_callback = {WasInterrupted, &bytes_};
+    companions_.Guard(*context);
+    int result = avformat_open_input(&context, url.c_str(), &format, settings.Get());
+    av::CheckMemory(result);
+    input_.reset(context);
+    if (result >= 0) {
+        result = avformat_find_stream_info(context, nullptr);
+        av::CheckMemory(result);
+    }
+    companions_.AllowRepetition();
+    if (!companions_.Refusal().empty())
+        throw SourceError(CannotOpen(path_, companions_.Refusal()));
+    if (result < 0 && context == nullptr)
+        throw SourceError(CannotOpen(path_, ReasonOf(result)));
+    if (result < 0)
+        throw SourceError("cannot read the streams of \"" + path_ + "\": " + av::ErrorText(result));
+}
+
+} // namespace movieconv

@@ -1,0 +1,47 @@
+// A movie's file, opened for reading: its bytes, and the demultiplexer that FFmpeg finds for them.
+#ifndef MOVIECONV_HOST_SOURCE_MOVIEFILE_H
+#define MOVIECONV_HOST_SOURCE_MOVIEFILE_H
+
+#include "ffmpeg/AvHandles.h"
+#include "host/source/CompanionFiles.h"
+#include "host/source/InputFile.h"
+
+#include <cstdint>
+#include <string>
+
+namespace movieconv {
+
+/// One thread at a time reads from it; Interrupt may be called from any.
+class MovieFile {
+public:
+    /// Opens `path` (bytes as the system has them) and finds out which streams there are. A movie is one
+    /// file: what names other files is opened only if `playlists`, and then may name only movies in its own
+    /// folder and below. Throws SourceError, PlaylistError for a playlist that was not allowed.
+    MovieFile(const std::string& path, bool playlists);
+    MovieFile(const MovieFile&) = delete;
+    MovieFile& operator=(const MovieFile&) = delete;
+
+    AVFormatContext* Context() const { return input_.get(); }
+
+    /// Bytes in the file; 0 when it has no size.
+    int64_t Bytes() const { return bytes_.Size(); }
+
+    /// Whether the bytes come from several files, of which only the one that names them is counted.
+    bool IsPlaylist() const;
+
+    /// Makes every read fail from now on, also one that is under way.
+    void Interrupt() { bytes_.Interrupt(); }
+
+private:
+    const AVInputFormat& Recognise(const std::string& url, bool playlists);
+    void Open(const std::string& url, const AVInputFormat& format);
+
+    const std::string path_;
+    CompanionFiles companions_;
+    InputFile bytes_;
+    av::Input input_;
+};
+
+} // namespace movieconv
+
+#endif

@@ -1,0 +1,24 @@
+// Why a source cannot be used.
+#ifndef MOVIECONV_HOST_SOURCE_SOURCEERROR_H
+#define MOVIECONV_HOST_SOURCE_SOURCEERROR_H
+
+#include <stdexcept>
+
+namespace movieconv {
+
+/// The source cannot be opened or holds nothing that can be converted. The text names the file and the
+/// reason.
+class SourceError : public std::runtime_error {
+public:
+    using std::runtime_error::runtime_error;
+};
+
+/// The source names other files, and nobody has allowed them to be read.
+class PlaylistError : public SourceError {
+public:
+    using SourceError::SourceError;
+};
+
+} // namespace movieconv
+
+#endif
