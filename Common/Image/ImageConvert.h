@@ -193,11 +193,11 @@ void YUV420_2_444Ex(unsigned char* pDst, unsigned char* pSrc, int W, int H);
 
 // --- Kernels
 
-/// The instruction set that the routines use in this process: "plain" (none in particular), "sse4.1", "avx2"
-/// or "avx512". It is the highest that the processor has, unless the environment variable
-/// MOVIECONV_COLOUR_LEVEL holds another of these names when the first routine, or this function, is called; a
-/// name that is unknown or that the processor lacks is passed over. The results are the same with all of
-/// them. The text is never freed.
+/// The instruction set that the routines use in this process: "plain" (none in particular), "sse4.1",
+/// "avx2" or "avx512", on 64-bit ARM "neon". It is the highest that the processor has, unless the environment
+/// variable MOVIECONV_COLOUR_LEVEL holds another of these names when the first routine, or this function, is
+/// called; a name that is unknown or that the processor lacks is passed over. The results are the same with
+/// all of them. The text is never freed.
 const char* ImageConvertLevel();
 
 // --- Trace

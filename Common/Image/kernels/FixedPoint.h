@@ -45,6 +45,39 @@ using FastRgbForm =
     RgbToYuvForm<14, 4211, 8258, 1606, -2425, -4768, 7193, 7193, -6029, -1163, 0, 11, -56, 2, 3>;
 using SimpleRgbForm = RgbToYuvForm<10, 263, 516, 100, -152, -298, 450, 450, -377, -73, 512, 1, -58, 4, 47>;
 
+/// RGB to YUV for multiplications of bytes into 16-bit lanes. A weight is whole * 2^kRestBits + rest, and
+///   component = (sum of wholes + (sum of rests >> kRestBits)) >> 8,
+/// so that the result is the upper byte of a lane: both sums fit 16 bits, and what the first shift drops is
+/// less than the last place of the wholes. The weights of U add up to 0, so U needs only B - G and R - G;
+/// those of V add up to kCrSum, so that times G is missing.
+template <int kBitsOfSet, int kYRed, int kYGreen, int kYBlue, int kCbRed, int kCbGreen, int kCbBlue,
+          int kCrRed, int kCrGreen, int kCrBlue, int kRoundingOfSet>
+struct SplitRgbForm {
+    static constexpr int kRestBits = kBitsOfSet - 8;
+    static constexpr int Whole(int weight) { return (weight + (1 << (kRestBits - 1))) >> kRestBits; }
+    static constexpr int Rest(int weight) { return weight - Whole(weight) * (1 << kRestBits); }
+
+    struct Weights {
+        int whole, rest;
+    };
+    static constexpr Weights Split(int weight) { return {Whole(weight), Rest(weight)}; }
+    static constexpr Weights kYOfBlue = Split(kYBlue), kYOfGreen = Split(kYGreen), kYOfRed = Split(kYRed);
+    static constexpr Weights kCbOfBlue = Split(kCbBlue), kCbOfRed = Split(kCbRed);
+    static constexpr Weights kCrOfBlue = Split(kCrBlue), kCrOfRed = Split(kCrRed);
+    static constexpr int kCrSum = kCrRed + kCrGreen + kCrBlue;
+    static constexpr int kRounding = kRoundingOfSet >> kRestBits;
+
+    static_assert(kRounding << kRestBits == kRoundingOfSet);
+    static_assert(kCbRed + kCbGreen + kCbBlue == 0);
+    static_assert(kCrSum == 0 || kCrSum == 1);
+    static_assert(255 * (kYOfBlue.whole + kYOfGreen.whole + kYOfRed.whole) + kRounding <= UINT16_MAX - 255);
+    static_assert(255 * kCbOfBlue.whole + kRounding <= INT16_MAX - 255);
+    static_assert(255 * kCrOfRed.whole + kRounding <= INT16_MAX - 255);
+};
+
+using FastSplitForm = SplitRgbForm<14, 4211, 8258, 1606, -2425, -4768, 7193, 7193, -6029, -1163, 0>;
+using SimpleSplitForm = SplitRgbForm<10, 263, 516, 100, -152, -298, 450, 450, -377, -73, 512>;
+
 /// YUV to RGB in 16-bit lanes: component = clamp((luma + chroma) >> 7) with
 ///   luma = 149 * Y - kBias and chroma = the term of the equation >> (its bits - 7), + kBias.
 /// The sum may leave 16 bits only where the clamp gives the same as a saturated sum. That holds for red and

@@ -54,6 +54,10 @@ const RowKernels* RowKernelsFor(KernelLevel level) {
     case KernelLevel::kAvx512:
         return HasAvx512() ? &kAvx512Kernels : nullptr;
 #endif
+#ifdef MOVIECONV_NEON_KERNELS
+    case KernelLevel::kNeon:
+        return &kNeonKernels;
+#endif
     default:
         return nullptr;
     }

@@ -68,7 +68,7 @@ struct RowKernels {
 inline constexpr ptrdiff_t kLargeWidthStep = 32;
 inline constexpr ptrdiff_t kLargeAlignment = 16;
 
-enum class KernelLevel { kPlain, kSse41, kAvx2, kAvx512 };
+enum class KernelLevel { kPlain, kSse41, kAvx2, kAvx512, kNeon };
 
 /// A level with the name by which users know it.
 struct NamedLevel {
@@ -78,7 +78,8 @@ struct NamedLevel {
 inline constexpr NamedLevel kKernelLevels[] = {{KernelLevel::kPlain, "plain"},
                                                {KernelLevel::kSse41, "sse4.1"},
                                                {KernelLevel::kAvx2, "avx2"},
-                                               {KernelLevel::kAvx512, "avx512"}};
+                                               {KernelLevel::kAvx512, "avx512"},
+                                               {KernelLevel::kNeon, "neon"}};
 
 /// The kernels of one level; null when the processor or this build lacks it.
 const RowKernels* RowKernelsFor(KernelLevel level);
@@ -105,6 +106,7 @@ extern const RowKernels kPlainKernels;
 extern const RowKernels kSse41Kernels;
 extern const RowKernels kAvx2Kernels;
 extern const RowKernels kAvx512Kernels;
+extern const RowKernels kNeonKernels;
 
 } // namespace image
 
