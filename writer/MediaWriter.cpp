@@ -96,6 +96,18 @@ void MWSetWriterOptions(const WriterOptions* options) {
     StatusBoard::Instance().SetOptions(options != nullptr ? *options : WriterOptions{});
 }
 
+uint32_t MWFindCodec(uint32_t format, uint32_t code, int forSound) {
+    const writer::Container* container = writer::FindContainer(format);
+    if (container == nullptr)
+        return 0;
+    if (forSound != 0) {
+        const writer::AudioCodec* codec = writer::FindAudioCodec(*container, code);
+        return codec != nullptr && writer::FindEncoder(*codec, 16) != nullptr ? codec->code : 0;
+    }
+    const writer::VideoCodec* codec = writer::FindVideoCodec(*container, code);
+    return codec != nullptr && writer::FindEncoder(*codec) != nullptr ? codec->code : 0;
+}
+
 int MWGetFileCount(void) {
     return StatusBoard::Instance().Count();
 }

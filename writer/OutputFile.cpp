@@ -143,9 +143,12 @@ std::unique_ptr<ByteFile> CreateBeside(FileSystem& files, const std::string& tar
                                        const std::string& suffix, std::string& path, int& error) {
     constexpr int kMostNumbers = 1000;
     const size_t nameAt = target.rfind('/') == std::string::npos ? 0 : target.rfind('/') + 1;
+    const long told = pathconf(nameAt == 0 ? "." : target.substr(0, nameAt).c_str(), _PC_NAME_MAX);
+    // Some file systems count characters and tell the most bytes that those may have.
+    const size_t longest = told > 0 ? std::min<size_t>(static_cast<size_t>(told), NAME_MAX) : NAME_MAX;
     for (int number = 1; number <= kMostNumbers; ++number) {
         const std::string tail = number == 1 ? suffix : suffix + std::to_string(number);
-        path = target.substr(0, nameAt) + CutName(target.substr(nameAt), NAME_MAX - tail.size()) + tail;
+        path = target.substr(0, nameAt) + CutName(target.substr(nameAt), longest - tail.size()) + tail;
         std::unique_ptr<ByteFile> file = files.Create(path, error);
         if (file || error != EEXIST)
             return file;

@@ -143,6 +143,10 @@ unsigned MWGetVersion(void);
 /// uses of its libraries. Zero: they are shown as FFmpeg does it by itself. The engine calls this.
 void MWForwardLog(int forward);
 
+/// The table's code of a codec for pictures (`forSound` 0) or sound that files of `format` can carry and this
+/// build of FFmpeg can encode, asked for by any of its names; 0 when there is none.
+uint32_t MWFindCodec(uint32_t format, uint32_t code, int forSound);
+
 #pragma GCC visibility pop
 #ifdef __cplusplus
 }

@@ -3,6 +3,7 @@
 #include "host/convert/Formats.h"
 #include "host/terminal/ExitCode.h"
 #include "media/FourCC.h"
+#include "writer/WriterStatus.h"
 
 #include <algorithm>
 #include <fmt/format.h>
@@ -24,12 +25,20 @@ uint32_t CodecCode(const std::string& text, const char* option) {
     return *code;
 }
 
-/// The codec asked for, or the usual one if the format carries it, or the format's first.
+uint32_t FindCarried(const std::string& asked, const FileFormatInfo& format, bool forSound) {
+    const char* option = forSound ? "--audio-codec" : "--video-codec";
+    const uint32_t code = MWFindCodec(format.fccFormat, CodecCode(asked, option), forSound ? 1 : 0);
+    if (code == 0) {
+        throw Failure(ExitCode::kUsage,
+                      fmt::format("{} cannot carry {} as \"{}\"; see \"movieconv --list-formats\"",
+                                  format.szName, forSound ? "sound" : "pictures", asked));
+    }
+    return code;
+}
+
+/// The usual codec if the format carries it, or the format's first.
 template <std::size_t N>
-uint32_t ChooseCodec(const std::optional<std::string>& asked, const char* option, uint32_t usual,
-                     const uint32_t (&carried)[N]) {
-    if (asked)
-        return CodecCode(*asked, option);
+uint32_t UsualCodec(uint32_t usual, const uint32_t (&carried)[N]) {
     const bool carriesUsual = std::find(std::begin(carried), std::end(carried), usual) != std::end(carried);
     return carriesUsual || carried[0] == 0 ? usual : carried[0];
 }
@@ -48,6 +57,10 @@ const FileFormatInfo& ChooseFormat(const Options& options) {
                                         "\"movieconv --list-formats\"",
                                         options.output));
     }
+    if (options.videoCodec)
+        FindCarried(*options.videoCodec, *format, false);
+    if (options.audioCodec)
+        FindCarried(*options.audioCodec, *format, true);
     return *format;
 }
 
@@ -55,8 +68,10 @@ EncodeParam PlanEncoding(const EncodeParam& defaults, const FileFormatInfo& form
                          const SourceInfo& source) {
     EncodeParam param = defaults;
     param.fccFileFormat = format.fccFormat;
-    param.fccVideo = ChooseCodec(options.videoCodec, "--video-codec", param.fccVideo, format.fccVideoCodecs);
-    param.fccAudio = ChooseCodec(options.audioCodec, "--audio-codec", param.fccAudio, format.fccAudioCodecs);
+    param.fccVideo = options.videoCodec ? FindCarried(*options.videoCodec, format, false)
+                                        : UsualCodec(param.fccVideo, format.fccVideoCodecs);
+    param.fccAudio = options.audioCodec ? FindCarried(*options.audioCodec, format, true)
+                                        : UsualCodec(param.fccAudio, format.fccAudioCodecs);
     if (options.size) {
         param.nWidth = options.size->width;
         param.nHeight = options.size->height;

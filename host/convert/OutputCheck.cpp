@@ -8,6 +8,7 @@
 
 #include <algorithm>
 #include <cerrno>
+#include <cmath>
 #include <cstring>
 #include <dirent.h>
 #include <fmt/format.h>
@@ -30,6 +31,21 @@ std::string NameOf(const std::string& path) {
 
 bool SameFile(const struct stat& a, const struct stat& b) {
     return a.st_dev == b.st_dev && a.st_ino == b.st_ino;
+}
+
+/// Refuses a name that the file system of its folder cannot take. `suffix` is what it gets behind it for a
+/// while, if that is not shortened there.
+void CheckName(const std::string& path, const std::string& suffix = "") {
+    const std::string whole = path + suffix;
+    const long most = pathconf(text::FolderOf(path).c_str(), _PC_NAME_MAX); // -1: no limit is known
+    struct stat status {};
+    const bool refused = lstat(whole.c_str(), &status) != 0 && errno == ENAMETOOLONG;
+    const std::string name = NameOf(whole);
+    if (refused || (most >= 0 && name.size() > static_cast<std::size_t>(most))) {
+        throw Failure(
+            ExitCode::kCannotWrite,
+            fmt::format("the name \"{}\" is too long for its file system; choose a shorter one", path));
+    }
 }
 
 /// Refuses a file that the conversion would replace.
@@ -90,6 +106,12 @@ bool IsClipName(std::string_view name, std::string_view base, std::string_view e
     return std::all_of(number.begin(), number.end(), [](char c) { return c >= '0' && c <= '9'; });
 }
 
+/// The last clip's number as the engine writes it; of a source of unknown length as if it lasted a day.
+std::string LastClipNumber(const Options& options) {
+    constexpr double kDay = 86400;
+    return fmt::format("{:02}", std::llround(options.length.value_or(kDay) / *options.split));
+}
+
 void CheckClips(const Options& options, const struct stat* input) {
     const std::string name = NameOf(options.output);
     const auto [base, extension] = SplitName(name);
@@ -99,14 +121,13 @@ void CheckClips(const Options& options, const struct stat* input) {
             fmt::format("with --split the output needs an extension, as in \"{}.mp4\"", options.output));
     }
     const std::size_t pathCharacters = text::FromUtf8(options.output).size();
-    constexpr std::size_t kNameBytes = 255;
-    if (pathCharacters + kClipNumberRoom > MC_MAX_TARGET_NAME || extension.size() > kLongestClipExtension ||
-        name.size() + 3 > kNameBytes) {
+    if (pathCharacters + kClipNumberRoom > MC_MAX_TARGET_NAME || extension.size() > kLongestClipExtension) {
         throw Failure(
             ExitCode::kUsage,
             fmt::format("the name \"{}\" is too long to number clips; choose a shorter one", options.output));
     }
     const std::string folder = text::FolderOf(options.output);
+    CheckName(fmt::format("{}/{}_{}{}", folder, base, LastClipNumber(options), extension));
     const std::unique_ptr<DIR, int (*)(DIR*)> listing(opendir(folder.c_str()), closedir);
     while (const dirent* entry = listing ? readdir(listing.get()) : nullptr)
         if (IsClipName(entry->d_name, base, extension))
@@ -158,10 +179,12 @@ void CheckOutput(const Options& options) {
     struct stat inputStatus {};
     const struct stat* input = stat(options.input.c_str(), &inputStatus) == 0 ? &inputStatus : nullptr;
     CheckFolder(text::FolderOf(options.output));
-    if (options.split)
+    if (options.split) {
         CheckClips(options, input);
-    else
+    } else {
+        CheckName(options.output);
         CheckTarget(options.output, input, options);
+    }
 }
 
 void CheckSideFiles(const Options& options) {
@@ -169,6 +192,7 @@ void CheckSideFiles(const Options& options) {
         CheckSideFile("--log", *options.log, options);
     if (options.preview) {
         CheckSideFile("--preview", *options.preview, options);
+        CheckName(*options.preview, ".part1000");
         CheckPreview(*options.preview, options.overwrite);
     }
     if (options.log && options.preview &&

@@ -10,7 +10,8 @@
 namespace movieconv {
 
 /// Throws Failure when the output, or a clip of it, would replace the input or an existing file without
-/// leave, cannot be written where it is to go, or has a name of which no clip names can be made.
+/// leave, cannot be written where it is to go, or has a name that is too long for the file system or of which
+/// no clip names can be made.
 void CheckOutput(const Options& options);
 
 /// Throws Failure when the log or the preview would be written over the source, the output, a clip of it or
