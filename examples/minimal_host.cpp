@@ -93,8 +93,8 @@ int main(int argc, char** argv) {
     if (MCStart(converter, 0.0, 0.0, nullptr, Report, &outcome) == 0)
         MCWait(converter, MC_INFINITE);
     MCDestroy(converter);
-    WriterStatus failure; // writing may fail where the engine finds nothing amiss
-    if (MWGetLastFailure(&failure))
+    WriterStatus failure{}; // writing may fail where the engine finds nothing amiss
+    if (MWGetLastFailure(kWriterDefaultSet, &failure))
         return std::fprintf(stderr, "%s: %s\n", failure.szPath, failure.szWhat), 1;
     return outcome == kOutcomeCompleted ? 0 : 1;
 }

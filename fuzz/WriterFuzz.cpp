@@ -203,8 +203,10 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
     static const Folder folder;
     FuzzedDataProvider input(data, size);
     const WriterOptions options = MakeOptions(input);
-    MWSetWriterOptions(&options);
-    const EncodeParam param = MakeParam(input);
+    const uint32_t set = MWRegisterOptions(&options);
+    FUZZ_CHECK(set != 0);
+    EncodeParam param = MakeParam(input);
+    param.nReserved[kWriterSetWord] = set;
     const VideoFormat video{Size(input, kMostWidth), Size(input, kMostHeight), Rate(input, 25.0), 1.0};
     const AudioFormat audio{WildInteger(input, 8000), WildInteger(input, 2), WildInteger(input, 16),
                             WildInteger(input, 32000), 1.0};
@@ -218,7 +220,8 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
     const bool complete = MWCloseMediaFile(file, nullptr, nullptr) != 0;
 
     WriterStatus status{};
-    FUZZ_CHECK(MWGetFileStatus(MWGetFileCount(), &status) == 1);
+    FUZZ_CHECK(MWGetFileStatus(set, MWGetFileCount(set), &status) == 1);
+    FUZZ_CHECK(MWUnregisterOptions(set) == 1);
     FUZZ_CHECK(complete == (status.nState == kWriterFileComplete));
     const bool well = complete || status.nState == kWriterFileEmpty;
     FUZZ_CHECK(well == (status.nError == kWriterErrorNone) && well == (status.szWhat[0] == '\0'));

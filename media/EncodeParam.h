@@ -25,7 +25,7 @@ typedef struct EncodeParam {
     int32_t nVideoBitrate;    ///< Video bit rate in bits per second.
     int32_t nVideoMaxBitrate; ///< Upper video bit rate in bits per second, used in two-rate mode.
     int32_t bResize;          ///< How the writer fits pictures into the output size; see the media writer.
-    uint32_t nReserved[5];    ///< Carried along, not interpreted.
+    uint32_t nReserved[5];    ///< Carried along unread; the media writer gives word 0 a meaning, 0 is none.
     uint32_t fccAudio;        ///< Audio codec, "AAC " by default.
     int32_t nSampleRate;      ///< Audio samples per second and channel.
     int32_t nChannels;        ///< Audio channels.

@@ -16,12 +16,12 @@
 #include "media/MediaRecords.h"
 #include "writer/AvioFile.h"
 #include "writer/FilePlan.h"
+#include "writer/FileRecord.h"
 #include "writer/Muxer.h"
 #include "writer/OutputFile.h"
 #include "writer/PictureStage.h"
 #include "writer/SoundStage.h"
 #include "writer/StampNormaliser.h"
-#include "writer/StatusBoard.h"
 
 #include <cstdint>
 #include <exception>

@@ -5,7 +5,7 @@
 #include "text/Utf8.h"
 #include "writer/FormatTable.h"
 #include "writer/MediaFile.h"
-#include "writer/StatusBoard.h"
+#include "writer/OptionSets.h"
 #include "writer/WriterStatus.h"
 
 #include <exception>
@@ -16,7 +16,8 @@ namespace {
 
 using writer::FileRecord;
 using writer::MediaFile;
-using writer::StatusBoard;
+using writer::OptionSet;
+using writer::OptionSets;
 using writer::WriterFailure;
 
 /// The result of `call`; `otherwise` when it throws.
@@ -37,29 +38,40 @@ void Refuse(FileRecord& record, const WriterFailure& failure) {
 
 MediaFile* Create(const wchar_t* fileName, const EncodeParam* param, const VideoFormat* video,
                   const AudioFormat* audio) {
+    std::shared_ptr<OptionSet> set = OptionSets::Instance().Named(param);
+    const bool known = set != nullptr;
+    if (!known) // the refusal has to be told somewhere
+        set = OptionSets::Instance().Find(kWriterDefaultSet);
     std::shared_ptr<FileRecord> record;
     try {
         const std::string target = fileName == nullptr ? std::string() : text::ToUtf8(fileName);
-        record = StatusBoard::Instance().Open(target);
+        record = set->Open(target);
         if (target.empty() || param == nullptr)
             throw WriterFailure(kWriterErrorArgument, "There is no file name, or there are no parameters.");
+        if (!known)
+            throw WriterFailure(kWriterErrorArgument, "The parameters name options that are not registered.");
         auto file = std::make_unique<MediaFile>(target, *param, video, audio, record, writer::SystemFiles());
         record->Tell(kWriterEventOpened);
         return file.release();
     } catch (...) {
         const WriterFailure failure = writer::FailureOf(std::current_exception());
-        FileRecord unlisted(0, "",
-                            StatusBoard::Instance().Options()); // where there is no memory for a record
+        FileRecord unlisted = set->Unlisted(); // where there is no memory for a record
         Refuse(record ? *record : unlisted, failure);
         return nullptr;
     }
 }
 
 int CopyStatus(const std::shared_ptr<const FileRecord>& record, WriterStatus* status) {
-    if (!record || status == nullptr)
-        return 0;
-    *status = record->Snapshot();
-    return 1;
+    return record && writer::CopyStatus(record->Snapshot(), status) ? 1 : 0;
+}
+
+/// What `call` gives of the set; 0 when there is none of that number.
+template <typename Call>
+int WithSet(uint32_t number, Call call) noexcept {
+    return Guarded(0, [&] {
+        const std::shared_ptr<OptionSet> set = OptionSets::Instance().Find(number);
+        return set ? call(*set) : 0;
+    });
 }
 
 } // namespace
@@ -92,8 +104,11 @@ int MWCloseMediaFile(void* file, ProgressCallback /*callback*/, void* /*context*
     return Guarded(0, [&] { return owned && owned->Close() ? 1 : 0; });
 }
 
-void MWSetWriterOptions(const WriterOptions* options) {
-    StatusBoard::Instance().SetOptions(options != nullptr ? *options : WriterOptions{});
+uint32_t MWRegisterOptions(const WriterOptions* options) {
+    return Guarded<uint32_t>(0, [&] {
+        const auto known = writer::ReadOptions(options);
+        return known ? OptionSets::Instance().Register(*known) : 0;
+    });
 }
 
 uint32_t MWFindCodec(uint32_t format, uint32_t code, int forSound) {
@@ -108,16 +123,29 @@ uint32_t MWFindCodec(uint32_t format, uint32_t code, int forSound) {
     return codec != nullptr && writer::FindEncoder(*codec) != nullptr ? codec->code : 0;
 }
 
-int MWGetFileCount(void) {
-    return StatusBoard::Instance().Count();
+int MWSetOptions(uint32_t set, const WriterOptions* options) {
+    return WithSet(set, [&](OptionSet& found) {
+        const auto known = writer::ReadOptions(options);
+        if (known)
+            found.SetOptions(*known);
+        return known ? 1 : 0;
+    });
 }
 
-int MWGetFileStatus(int sequence, WriterStatus* status) {
-    return Guarded(0, [&] { return CopyStatus(StatusBoard::Instance().Find(sequence), status); });
+int MWUnregisterOptions(uint32_t set) {
+    return Guarded(0, [&] { return OptionSets::Instance().Unregister(set) ? 1 : 0; });
 }
 
-int MWGetLastFailure(WriterStatus* status) {
-    return Guarded(0, [&] { return CopyStatus(StatusBoard::Instance().LastFailure(), status); });
+int MWGetFileCount(uint32_t set) {
+    return WithSet(set, [](OptionSet& found) { return found.Count(); });
+}
+
+int MWGetFileStatus(uint32_t set, int sequence, WriterStatus* status) {
+    return WithSet(set, [&](OptionSet& found) { return CopyStatus(found.Find(sequence), status); });
+}
+
+int MWGetLastFailure(uint32_t set, WriterStatus* status) {
+    return WithSet(set, [&](OptionSet& found) { return CopyStatus(found.LastFailure(), status); });
 }
 
 unsigned MWGetVersion(void) {

@@ -1,14 +1,32 @@
 /// \file
 /// The media writer's second header: what the five functions of media/MediaWriter.h have no room for. A host
-/// sets options here before a conversion, and learns here how each file stands and what went wrong. The
+/// registers the options of a conversion here, and learns here how its files stand and what went wrong. The
 /// engine needs none of it.
 ///
-/// All functions may be called on any thread. Texts are UTF-8; bytes of a file name that are not UTF-8 stand
+/// Options belong to a set with a number, and so do the files that are created with them:
+///
+///     WriterOptions options{}; // in C = {0}, and options.nSize = sizeof options
+///     options.bKeepExisting = 1;
+///     param.nReserved[kWriterSetWord] = MWRegisterOptions(&options);
+///     ... MCSetEncodeParam(converter, &param), a conversion, MCDestroy(converter) ...
+///     MWUnregisterOptions(param.nReserved[kWriterSetWord]);
+///
+/// Conversions with sets of their own know nothing of each other, however many there are at once. Those whose
+/// parameters name no set share kWriterDefaultSet.
+///
+/// Records begin with their size, so that they can grow; in C, the caller fills it in. All functions may be
+/// called on any thread. Texts are UTF-8; bytes of a file name that are not UTF-8 stand
 /// as they are.
 #ifndef MOVIECONV_WRITER_WRITERSTATUS_H
 #define MOVIECONV_WRITER_WRITERSTATUS_H
 
 #include <stdint.h>
+
+#ifdef __cplusplus
+#define MW_SIZE_OF(record) = sizeof(record)
+#else
+#define MW_SIZE_OF(record)
+#endif
 
 #ifdef __cplusplus
 extern "C" {
@@ -41,12 +59,19 @@ enum {
     kWriterErrorInternal = 10 ///< Out of memory, or a fault of the writer.
 };
 
+enum {
+    kWriterDefaultSet = 0, ///< Always registered.
+    kWriterSetWord = 0     ///< The word of EncodeParam::nReserved that holds the number of a set.
+};
+
 enum { kWriterTextSize = 512, kWriterPathSize = 4096 };
 
 /// One output file, as it stands. Lengths are in seconds, sizes in bytes, samples in sample frames (one per
 /// channel).
 typedef struct WriterStatus {
-    int32_t nSequence;    ///< Number of the file in this process, from 1, in the order of creation.
+    uint32_t nSize MW_SIZE_OF(WriterStatus); ///< Size of this record in bytes.
+    uint32_t nSet;                           ///< The set of options that the file was created with.
+    int32_t nSequence;    ///< Number of the file in its set, from 1, in the order of creation.
     int32_t nState;       ///< kWriterFile...
     int32_t nError;       ///< kWriterError...; the first one of this file stays.
     int32_t nSystemError; ///< errno of the failed call, 0 when the fault is not the system's.
@@ -101,8 +126,9 @@ typedef void (*WriterListener)(void* context, int event, const WriterStatus* sta
 /// full.
 typedef int (*WriterFullDiskHandler)(void* context, const WriterStatus* status);
 
-/// Options for the files created from now on; all zero is the default.
+/// Options for files; all zero but the size is the default.
 typedef struct WriterOptions {
+    uint32_t nSize MW_SIZE_OF(WriterOptions); ///< Size of this record in bytes.
     int32_t nSampleAspectNum; ///< Shape of the source's pixels, width to height; 0 or 0:0 counts as 1:1.
     int32_t nSampleAspectDen; ///< The height of that proportion.
     int32_t bFullRange;       ///< Nonzero: luma covers 0 to 255, not 16 to 235.
@@ -121,20 +147,31 @@ typedef struct WriterOptions {
     void* pContext;                    ///< First argument of both.
 } WriterOptions;
 
-/// Sets the options for files created from now on, in the whole process; files that are open keep theirs.
-/// Null restores the defaults. A listener is not called any more once the files created with it are closed.
-void MWSetWriterOptions(const WriterOptions* options);
+/// Registers a set with these options. Returns its number, which is never kWriterDefaultSet, or 0 when
+/// `options` is null, its size makes no sense, it has options that this version of the writer does not know,
+/// or there is no memory.
+uint32_t MWRegisterOptions(const WriterOptions* options);
 
-/// Files created so far in this process, refused ones counted: the highest sequence number.
-int MWGetFileCount(void);
+/// Changes the options of a set for files created from now on; files that are open keep theirs. Returns 1; 0
+/// as MWRegisterOptions does, and when there is no such set.
+int MWSetOptions(uint32_t set, const WriterOptions* options);
 
-/// Copies how file `sequence` stands. Open files and the last 64 others are remembered. Returns 1; 0 when the
-/// file is not known (any more) or `status` is null.
-int MWGetFileStatus(int sequence, WriterStatus* status);
+/// Forgets a set and what became of its files. Files that are open keep their options and are finished all
+/// the same; a listener is not called any more once the last file that was created with it is closed. A file
+/// whose parameters name the set is refused from now on. Returns 1; 0 when there is no such set, or when it
+/// is the default one.
+int MWUnregisterOptions(uint32_t set);
 
-/// Copies the latest remembered status that carries an error. Returns 1; 0 when no file has failed yet or
-/// `status` is null.
-int MWGetLastFailure(WriterStatus* status);
+/// Files of the set created so far, refused ones counted: the highest sequence number. 0 without such a set.
+int MWGetFileCount(uint32_t set);
+
+/// Copies how file `sequence` of the set stands. Open files and the last 64 others are remembered. Returns 1;
+/// 0 when the set or the file is not known (any more), or `status` is null or its size makes no sense.
+int MWGetFileStatus(uint32_t set, int sequence, WriterStatus* status);
+
+/// Copies the latest remembered status of the set that carries an error. Returns 1; 0 when none of its files
+/// has failed, and as MWGetFileStatus does.
+int MWGetLastFailure(uint32_t set, WriterStatus* status);
 
 /// The writer's version, as MC_MAKE_VERSION makes it. An engine of another major version refuses the writer.
 unsigned MWGetVersion(void);
@@ -148,6 +185,7 @@ void MWForwardLog(int forward);
 uint32_t MWFindCodec(uint32_t format, uint32_t code, int forSound);
 
 #pragma GCC visibility pop
+#undef MW_SIZE_OF
 #ifdef __cplusplus
 }
 #endif

@@ -34,13 +34,14 @@ WorkClock::Time Now() {
 
 } // namespace
 
-Converter MakeConverter(const Options& options, Movie& movie) {
+Converter MakeConverter(const Options& options, Movie& movie, uint32_t writerSet) {
     const FileFormatInfo& format = ChooseFormat(options);
     Converter converter(MCCreate(movie.Pictures(), movie.Sound()));
     EncodeParam defaults{};
     if (!converter || MCGetEncodeParam(converter.get(), &defaults) == 0)
         throw Failure(ExitCode::kInternal, "no memory for the converter");
-    const EncodeParam param = PlanEncoding(defaults, format, options, movie.Info());
+    EncodeParam param = PlanEncoding(defaults, format, options, movie.Info());
+    param.nReserved[kWriterSetWord] = writerSet;
     MCSetEncodeParam(converter.get(), &param);
     MCSetOutputFile(converter.get(), text::FromUtf8(options.output).c_str());
     if (options.split && param.bNoVideo != 0)
@@ -59,7 +60,7 @@ Conversion::Conversion(const Options& options, Movie& movie, Reporter& reporter,
       length_(LengthToConvert(options, movie.Info())),
       watch_(options, movie.Info()),
       files_(reporter),
-      converter_(MakeConverter(options, movie)),
+      converter_(MakeConverter(options, movie, watch_.OptionSet())),
       clock_(Now()) {
     if (options.length)
         movie.EndPicturesAt(options.begin + length_);
@@ -72,7 +73,7 @@ ExitCode Conversion::Run() {
     reporter_.Start({options_.input, options_.output, length_, lengthKnown});
     if (lengthKnown || options_.length)
         WarnOfSmallRoom();
-    control_.Arm(options_.progress == ProgressStyle::kBar && !options_.quiet);
+    control_.Arm(options_.progress == ProgressStyle::kBar && !options_.quiet, watch_.OptionSet());
     clock_.Skip(Now());
     if (MCStart(converter_.get(), options_.begin, options_.length.value_or(0), nullptr, OnProgress, this) !=
         0)
@@ -122,7 +123,7 @@ void Conversion::WaitForEnd() {
         control_.FollowTerminal();
         if (event)
             Handle(*event);
-        if (outcome_ == kNone && WriterWatch::FileVanished())
+        if (outcome_ == kNone && watch_.FileVanished())
             Stop(); // whatever else were converted would be lost
         if (outcome_ == kNone)
             ReportProgress();

@@ -28,8 +28,9 @@ struct ConverterFree {
 };
 using Converter = std::unique_ptr<void, ConverterFree>;
 
-/// A converter for the movie with its parameters set as the options ask. Throws Failure.
-Converter MakeConverter(const Options& options, Movie& movie);
+/// A converter for the movie with its parameters set as the options ask, for files with these options of the
+/// writer. Throws Failure.
+Converter MakeConverter(const Options& options, Movie& movie, uint32_t writerSet = kWriterDefaultSet);
 
 class Conversion {
 public:

@@ -17,6 +17,11 @@ namespace {
 constexpr std::chrono::seconds kRetryInterval{1};
 constexpr int64_t kEnoughRoom = 4 << 20;
 
+/// How the set's latest file stands; false when there is none.
+bool LatestFile(uint32_t set, WriterStatus& status) {
+    return MWGetFileStatus(set, MWGetFileCount(set), &status) != 0;
+}
+
 } // namespace
 
 WriterWatch::WriterWatch(const Options& options, const SourceInfo& source) {
@@ -33,11 +38,13 @@ WriterWatch::WriterWatch(const Options& options, const SourceInfo& source) {
     writer.pfnListener = OnEvent;
     writer.pfnFullDisk = options.onFull == OnFull::kWait ? OnFullDisk : nullptr;
     writer.pContext = this;
-    MWSetWriterOptions(&writer);
+    set_ = MWRegisterOptions(&writer);
+    if (set_ == 0)
+        throw std::bad_alloc();
 }
 
 WriterWatch::~WriterWatch() {
-    MWSetWriterOptions(nullptr);
+    MWUnregisterOptions(set_);
 }
 
 std::optional<WriterWatch::News> WriterWatch::Take() {
@@ -61,16 +68,16 @@ void WriterWatch::GiveUp() {
 
 int64_t WriterWatch::Bytes() const {
     const auto status = std::make_unique<WriterStatus>();
-    const bool open = MWGetFileStatus(MWGetFileCount(), status.get()) != 0 &&
+    const bool open = LatestFile(set_, *status) &&
                       (status->nState == kWriterFileWriting || status->nState == kWriterFileFinishing);
     return closedBytes_ + (open ? status->llBytesWritten : 0);
 }
 
-bool WriterWatch::FileVanished() {
+bool WriterWatch::FileVanished() const {
     const auto before = std::make_unique<WriterStatus>();
     const auto after = std::make_unique<WriterStatus>();
-    const auto isWritten = [](WriterStatus& status) {
-        return MWGetFileStatus(MWGetFileCount(), &status) != 0 && status.nState == kWriterFileWriting &&
+    const auto isWritten = [this](WriterStatus& status) {
+        return LatestFile(set_, status) && status.nState == kWriterFileWriting &&
                status.szTemporaryPath[0] != '\0';
     };
     // A close may give the file its name in between.

@@ -15,7 +15,7 @@
 
 namespace movieconv {
 
-/// Sets the writer's options for as long as it exists. There is one at a time.
+/// Registers the writer's options for one conversion, for as long as it exists: longer than the converter.
 class WriterWatch {
 public:
     struct News {
@@ -34,8 +34,11 @@ public:
     /// Whether the writer waits for room on a full disk.
     bool WaitsForRoom() const { return waiting_; }
 
+    /// The number of the set of options, for EncodeParam::nReserved[kWriterSetWord].
+    uint32_t OptionSet() const { return set_; }
+
     /// Whether the file that is being written has lost its place, by its own removal or the folder's.
-    static bool FileVanished();
+    bool FileVanished() const;
 
     /// Ends that waiting: the file fails.
     void GiveUp();
@@ -48,6 +51,7 @@ private:
     static int OnFullDisk(void* context, const WriterStatus* status);
     int WaitForRoom(const WriterStatus& status);
 
+    uint32_t set_ = 0;
     mutable std::mutex mutex_;
     std::condition_variable changed_;
     std::deque<News> news_;

@@ -88,7 +88,8 @@ ControlInput::~ControlInput() {
     close(wake_);
 }
 
-void ControlInput::Arm(bool keys) {
+void ControlInput::Arm(bool keys, uint32_t writerSet) {
+    writerSet_ = writerSet;
     wantsKeys_ = keys;
     FollowTerminal();
     armed_ = true;
@@ -172,7 +173,7 @@ void ControlInput::LeaveAtOnce(int signal) {
     RestoreTerminal();
     try {
         const auto status = std::make_unique<WriterStatus>();
-        if (armed_ && MWGetFileStatus(MWGetFileCount(), status.get()) != 0 &&
+        if (armed_ && MWGetFileStatus(writerSet_, MWGetFileCount(writerSet_), status.get()) != 0 &&
             status->szTemporaryPath[0] != '\0') {
             WriteAll(STDERR_FILENO,
                      fmt::format("\nmovieconv: left at once; what was written so far is in \"{}\"\n",

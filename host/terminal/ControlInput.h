@@ -4,6 +4,7 @@
 
 #include <atomic>
 #include <chrono>
+#include <cstdint>
 #include <optional>
 #include <thread>
 
@@ -22,8 +23,9 @@ public:
     ControlInput(const ControlInput&) = delete;
     ControlInput& operator=(const ControlInput&) = delete;
 
-    /// From now on there is something to finish. Starts to listen to the keyboard if `keys` and there is one.
-    void Arm(bool keys);
+    /// From now on there is something to finish: files with this set of the writer's options. Starts to
+    /// listen to the keyboard if `keys` and there is one.
+    void Arm(bool keys, uint32_t writerSet);
 
     /// Listens to the keyboard while the terminal is this job's; the shell gives it away and back without
     /// telling. To be called now and then.
@@ -47,6 +49,7 @@ private:
     int signals_ = -1;
     int wake_ = -1;
     std::atomic<bool> armed_{false};
+    std::atomic<uint32_t> writerSet_{0};
     std::atomic<bool> wantsKeys_{false};
     std::atomic<bool> keys_{false};
     std::optional<Clock::time_point> stopAsked_; // the thread's

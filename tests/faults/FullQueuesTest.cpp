@@ -26,7 +26,7 @@ constexpr int64_t kPicturesHeld = 1 + 1;
 
 WriterStatus Status() {
     WriterStatus status{};
-    MWGetFileStatus(MWGetFileCount(), &status);
+    MWGetFileStatus(kWriterDefaultSet, MWGetFileCount(kWriterDefaultSet), &status);
     return status;
 }
 

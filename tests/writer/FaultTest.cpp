@@ -3,8 +3,8 @@
 #include "MovieReader.h"
 #include "tests/support/Folder.h"
 #include "writer/MediaFile.h"
+#include "writer/OptionSets.h"
 #include "writer/OutputFile.h"
-#include "writer/StatusBoard.h"
 
 #include <gtest/gtest.h>
 
@@ -84,18 +84,16 @@ protected:
                 static_cast<Fault*>(context)->events_.push_back(event);
         };
     }
-    ~Fault() override { MWSetWriterOptions(nullptr); }
-
     /// Writes the movie and gives the last status of the file.
     WriterStatus Run() {
-        MWSetWriterOptions(&options_);
+        writer::OptionSet set(kWriterDefaultSet, options_);
         events_.clear();
         created_ = false;
         faults_.writes = 0;
         FaultyFiles files(faults_);
         const VideoFormat video = movie_.Video();
         const AudioFormat audio = movie_.Audio();
-        const auto record = writer::StatusBoard::Instance().Open(path_);
+        const auto record = set.Open(path_);
         try {
             auto file =
                 std::make_unique<writer::MediaFile>(path_, movie_.param, &video, &audio, record, files);

@@ -69,7 +69,7 @@ public:
         sound_.Next(kSamples, 0); // its memory
         WriterOptions options{};
         options.pfnListener = Listen;
-        MWSetWriterOptions(&options);
+        MWSetOptions(kWriterDefaultSet, &options);
         param_.fccFileFormat = file_.format;
         param_.fccVideo = file_.video;
         param_.fccAudio = file_.audio;

@@ -125,8 +125,8 @@ ReadMovie WriteAndRead(const TestMovie& movie, const std::function<void(void* fi
     return ReadMovieFile(folder / "movie");
 }
 
-WriterStatus Latest() {
+WriterStatus Latest(uint32_t set) {
     WriterStatus status{};
-    EXPECT_EQ(MWGetFileStatus(MWGetFileCount(), &status), 1);
+    EXPECT_EQ(MWGetFileStatus(set, MWGetFileCount(set), &status), 1);
     return status;
 }

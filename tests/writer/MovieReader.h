@@ -51,7 +51,7 @@ ReadMovie ReadMovieFile(const std::string& path);
 /// the writer does not say that the file is complete.
 ReadMovie WriteAndRead(const TestMovie& movie, const std::function<void(void* file)>& write = nullptr);
 
-/// The status of the file created last.
-WriterStatus Latest();
+/// The status of the file created last with this set of options.
+WriterStatus Latest(uint32_t set = kWriterDefaultSet);
 
 #endif

@@ -70,10 +70,10 @@ TEST(Pictures, AnotherOutputSizeIsBorderedOrStretchedAndTheShapeOfPixelsIsCarrie
     WriterOptions options{};
     options.nSampleAspectNum = 16;
     options.nSampleAspectDen = 11;
-    MWSetWriterOptions(&options);
+    const RegisteredOptions registered(options);
+    movie.Use(registered);
     movie.param.bResize = 1;
     const ReadMovie stretched = WriteAndRead(movie);
-    MWSetWriterOptions(nullptr);
     ASSERT_EQ(stretched.pictures.size(), 50U);
     EXPECT_GT(stretched.pictures[0].At(300, 60), 30);
     EXPECT_EQ(av_cmp_q(stretched.sampleAspect, {8, 11}), 0);

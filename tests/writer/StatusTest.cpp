@@ -4,9 +4,13 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
+#include <atomic>
 #include <cerrno>
 #include <filesystem>
+#include <memory>
 #include <string>
+#include <thread>
 #include <vector>
 
 namespace {
@@ -87,7 +91,7 @@ TEST(MediaWriter, GivesNullAndTheReason) {
         refusal.spoil(movie);
         EXPECT_EQ(movie.Create(folder / "movie"), nullptr);
         WriterStatus status{};
-        ASSERT_EQ(MWGetLastFailure(&status), 1);
+        ASSERT_EQ(MWGetLastFailure(kWriterDefaultSet, &status), 1);
         EXPECT_EQ(status.nError, refusal.error);
         EXPECT_EQ(status.nState, kWriterFileFailed);
         EXPECT_EQ(status.szPath, folder / "movie");
@@ -115,19 +119,21 @@ TEST(MediaWriter, KeepsAnExistingFileWhenAsked) {
     WriteFile(path, "precious");
     WriterOptions options{};
     options.bKeepExisting = 1;
-    MWSetWriterOptions(&options);
-    EXPECT_EQ(TestMovie().Create(path), nullptr);
-    EXPECT_EQ(Latest().nError, kWriterErrorExists);
+    const RegisteredOptions registered(options);
+    TestMovie movie;
+    movie.Use(registered);
+    EXPECT_EQ(movie.Create(path), nullptr);
+    EXPECT_EQ(Latest(registered.Set()).nError, kWriterErrorExists);
     // One that appears in the meantime is kept as well.
     std::filesystem::remove(path);
-    void* file = TestMovie().Create(path);
-    TestMovie().WriteAll(file);
+    void* file = movie.Create(path);
+    movie.WriteAll(file);
     WriteFile(path, "precious");
     EXPECT_EQ(MWCloseMediaFile(file, nullptr, nullptr), 0);
-    EXPECT_EQ(Latest().nSystemError, EEXIST);
+    const WriterStatus status = Latest(registered.Set());
+    EXPECT_EQ(status.nSystemError, EEXIST);
     EXPECT_EQ(std::filesystem::file_size(path), 8U);
-    EXPECT_EQ(ReadMovieFile(Latest().szTemporaryPath).pictures.size(), 50U);
-    MWSetWriterOptions(nullptr);
+    EXPECT_EQ(ReadMovieFile(status.szTemporaryPath).pictures.size(), 50U);
 }
 
 TEST(MediaWriter, WritesThroughALinkAndLeavesIt) {
@@ -147,12 +153,13 @@ TEST(MediaWriter, DoesNotTouchTheRemainsOfAnEarlierRun) {
     EXPECT_EQ(std::filesystem::file_size(folder / "movie.part"), 7U);
 }
 
-TEST(MediaWriter, TellsAListenerOfAFilesLife) {
-    struct Heard {
-        std::vector<int> events;
-        std::vector<double> finished;
-        WriterStatus last;
-    } heard{};
+struct Heard {
+    std::vector<int> events;
+    std::vector<double> finished;
+    WriterStatus last;
+};
+
+WriterOptions ToldTo(Heard& heard) {
     WriterOptions options{};
     options.pContext = &heard;
     options.pfnListener = [](void* context, int event, const WriterStatus* status) {
@@ -163,11 +170,19 @@ TEST(MediaWriter, TellsAListenerOfAFilesLife) {
             self->finished.push_back(status->dFinished);
         self->last = *status;
     };
-    MWSetWriterOptions(&options);
+    return options;
+}
+
+const std::vector<int> kWholeLife{kWriterEventOpened, kWriterEventFinishing, kWriterEventClosed};
+
+TEST(MediaWriter, TellsAListenerOfAFilesLife) {
+    Heard heard{};
+    const RegisteredOptions registered(ToldTo(heard));
+    TestMovie movie;
+    movie.Use(registered);
     const Folder folder;
-    EXPECT_TRUE(TestMovie().Write(folder / "movie"));
-    EXPECT_EQ(heard.events,
-              (std::vector<int>{kWriterEventOpened, kWriterEventFinishing, kWriterEventClosed}));
+    EXPECT_TRUE(movie.Write(folder / "movie"));
+    EXPECT_EQ(heard.events, kWholeLife);
     EXPECT_TRUE(std::is_sorted(heard.finished.begin(), heard.finished.end()));
     EXPECT_GT(heard.finished.size(), 3U);
     EXPECT_EQ(heard.last.nState, kWriterFileComplete);
@@ -177,24 +192,159 @@ TEST(MediaWriter, TellsAListenerOfAFilesLife) {
     EXPECT_DOUBLE_EQ(heard.last.dVideoReceived, 2.0);
     EXPECT_NEAR(heard.last.dAudioReceived, 2.0, 1e-6);
     EXPECT_DOUBLE_EQ(heard.last.dFinished, 1.0);
-    MWSetWriterOptions(nullptr);
 }
 
 TEST(MediaWriter, RemembersTheLatestFilesOnly) {
     WriterStatus status{};
-    EXPECT_EQ(MWGetFileStatus(0, &status), 0);
-    EXPECT_EQ(MWGetFileStatus(MWGetFileCount() + 1, &status), 0);
+    const RegisteredOptions registered(WriterOptions{});
+    const uint32_t set = registered.Set();
+    TestMovie movie;
+    movie.Use(registered);
+    EXPECT_EQ(MWGetFileStatus(set, 0, &status), 0);
+    EXPECT_EQ(MWGetFileStatus(set, 1, &status), 0);
     const Folder folder;
-    void* open = TestMovie().Create(folder / "open");
-    const int number = MWGetFileCount();
+    void* open = movie.Create(folder / "open");
     for (int i = 0; i < 80; ++i)
-        MWCreateMediaFile(L"", nullptr, nullptr, nullptr);
-    EXPECT_EQ(MWGetFileStatus(number, &status), 1) << "an open file is forgotten";
+        MWCreateMediaFile(L"", &movie.param, nullptr, nullptr);
+    EXPECT_EQ(MWGetFileCount(set), 81);
+    EXPECT_EQ(MWGetFileStatus(set, 1, &status), 1) << "an open file is forgotten";
     EXPECT_EQ(status.nState, kWriterFileWriting);
-    EXPECT_EQ(MWGetFileStatus(number + 1, &status), 0);
-    EXPECT_EQ(MWGetFileStatus(number + 80, &status), 1);
-    EXPECT_EQ(MWGetFileStatus(number, nullptr), 0);
+    EXPECT_EQ(MWGetFileStatus(set, 2, &status), 0);
+    EXPECT_EQ(MWGetFileStatus(set, 81, &status), 1);
     MWCloseMediaFile(open, nullptr, nullptr);
+}
+
+TEST(OptionSets, KeepFilesFailuresAndListenersApart) {
+    const Folder folder;
+    Heard first{};
+    Heard second{};
+    const RegisteredOptions firstSet(ToldTo(first));
+    const RegisteredOptions secondSet(ToldTo(second));
+    ASSERT_NE(firstSet.Set(), secondSet.Set());
+    TestMovie good;
+    good.Use(firstSet);
+    TestMovie bad;
+    bad.Use(secondSet);
+    bad.param.fccVideo = FourCC("ABCD");
+    const int unnamed = MWGetFileCount(kWriterDefaultSet);
+    EXPECT_EQ(bad.Create(folder / "bad"), nullptr);
+    EXPECT_TRUE(good.Write(folder / "good"));
+    EXPECT_EQ(first.events, kWholeLife);
+    EXPECT_EQ(second.events, std::vector<int>{kWriterEventRefused});
+    EXPECT_EQ(MWGetFileCount(firstSet.Set()), 1);
+    EXPECT_EQ(MWGetFileCount(secondSet.Set()), 1);
+    EXPECT_EQ(MWGetFileCount(kWriterDefaultSet), unnamed);
+    WriterStatus status{};
+    EXPECT_EQ(MWGetLastFailure(firstSet.Set(), &status), 0);
+    EXPECT_EQ(MWGetLastFailure(secondSet.Set(), &status), 1);
+    EXPECT_EQ(status.szPath, folder / "bad");
+    EXPECT_EQ(status.nSet, secondSet.Set());
+    EXPECT_EQ(Latest(firstSet.Set()).szPath, folder / "good");
+}
+
+TEST(OptionSets, AnOpenFileKeepsItsOwnWhateverBecomesOfThem) {
+    const Folder folder;
+    Heard before{};
+    Heard after{};
+    const WriterOptions other = ToldTo(after);
+    auto registered = std::make_unique<RegisteredOptions>(ToldTo(before));
+    const uint32_t set = registered->Set();
+    TestMovie movie;
+    movie.Use(*registered);
+    void* file = movie.Create(folder / "movie");
+    EXPECT_EQ(MWSetOptions(set, &other), 1);
+    registered.reset();
+    movie.WriteAll(file);
+    EXPECT_EQ(MWCloseMediaFile(file, nullptr, nullptr), 1);
+    EXPECT_EQ(before.events, kWholeLife);
+    EXPECT_TRUE(after.events.empty());
+    // Nothing is known of the set any more, and nothing falls back to other options.
+    WriterStatus status{};
+    EXPECT_EQ(MWGetFileCount(set), 0);
+    EXPECT_EQ(MWGetFileStatus(set, 1, &status), 0);
+    EXPECT_EQ(MWSetOptions(set, &other), 0);
+    EXPECT_EQ(MWUnregisterOptions(set), 0);
+    EXPECT_EQ(movie.Create(folder / "late"), nullptr);
+    EXPECT_EQ(Latest().nError, kWriterErrorArgument);
+    EXPECT_EQ(Latest().szPath, folder / "late");
+}
+
+TEST(OptionSets, TheDefaultOneServesWhoeverNamesNone) {
+    const Folder folder;
+    TestMovie movie;
+    movie.param.nReserved[kWriterSetWord] = 12345; // not the number of a set: whatever it means, not to us
+    EXPECT_TRUE(movie.Write(folder / "movie"));
+    EXPECT_EQ(Latest().szPath, folder / "movie");
+    EXPECT_EQ(MWUnregisterOptions(kWriterDefaultSet), 0);
+    WriterOptions options{};
+    options.bKeepExisting = 1;
+    EXPECT_EQ(MWSetOptions(kWriterDefaultSet, &options), 1);
+    EXPECT_EQ(TestMovie().Create(folder / "movie"), nullptr);
+    options.bKeepExisting = 0;
+    EXPECT_EQ(MWSetOptions(kWriterDefaultSet, &options), 1);
+}
+
+TEST(OptionSets, TakeRecordsOfEverySizeThatMakesSense) {
+    const RegisteredOptions registered(WriterOptions{});
+    struct {
+        WriterOptions known{};
+        int32_t later[4]{};
+    } options;
+    const auto set = [&](size_t size) {
+        options.known.nSize = static_cast<uint32_t>(size);
+        return MWSetOptions(registered.Set(), &options.known);
+    };
+    EXPECT_EQ(set(sizeof options), 1);
+    options.later[3] = 1;
+    EXPECT_EQ(set(sizeof options), 0) << "an option that is not known is passed over";
+    EXPECT_EQ(set(sizeof(WriterOptions)), 1);
+    EXPECT_EQ(set(sizeof(WriterOptions) - 1), 0);
+    EXPECT_EQ(set(0), 0);
+    EXPECT_EQ(MWSetOptions(registered.Set(), nullptr), 0);
+    EXPECT_EQ(MWRegisterOptions(nullptr), 0U);
+
+    MWCreateMediaFile(L"", nullptr, nullptr, nullptr);
+    struct {
+        WriterStatus known{};
+        int32_t later[4] = {7, 7, 7, 7};
+    } status;
+    const auto get = [&](size_t size) {
+        status.known.nSize = static_cast<uint32_t>(size);
+        return MWGetLastFailure(kWriterDefaultSet, &status.known);
+    };
+    EXPECT_EQ(get(sizeof status), 1);
+    EXPECT_EQ(status.known.nSize, sizeof(WriterStatus)) << "how much was written must be told";
+    EXPECT_EQ(status.later[0], 7);
+    EXPECT_EQ(get(sizeof(WriterStatus) - 1), 0);
+    EXPECT_EQ(get(0), 0);
+    EXPECT_EQ(MWGetLastFailure(kWriterDefaultSet, nullptr), 0);
+}
+
+TEST(OptionSets, AreRegisteredUsedAndForgottenOnManyThreads) {
+    const Folder folder;
+    std::vector<std::thread> threads;
+    std::atomic<int> good{0};
+    for (int number = 0; number < 8; ++number) {
+        threads.emplace_back([&, number] {
+            for (int round = 0; round < 4; ++round) {
+                Heard heard{};
+                const RegisteredOptions registered(ToldTo(heard));
+                TestMovie movie;
+                movie.Use(registered);
+                movie.pictures = 5;
+                movie.soundSeconds = 0.2;
+                const std::string path = folder / (std::to_string(number) + "-" + std::to_string(round));
+                const bool complete = movie.Write(path);
+                WriterStatus status{};
+                if (complete && MWGetFileCount(registered.Set()) == 1 && heard.events == kWholeLife &&
+                    MWGetFileStatus(registered.Set(), 1, &status) == 1 && status.szPath == path)
+                    ++good;
+            }
+        });
+    }
+    for (std::thread& thread : threads)
+        thread.join();
+    EXPECT_EQ(good, 32);
 }
 
 } // namespace

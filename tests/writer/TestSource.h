@@ -6,6 +6,7 @@
 #include "media/FourCC.h"
 #include "media/MediaRecords.h"
 #include "media/MediaWriter.h"
+#include "writer/WriterStatus.h"
 
 #include <cstdint>
 #include <functional>
@@ -41,6 +42,20 @@ private:
     int64_t position_ = 0;
 };
 
+/// Options that are registered for as long as this object lives.
+class RegisteredOptions {
+public:
+    explicit RegisteredOptions(const WriterOptions& options) : set_(MWRegisterOptions(&options)) {}
+    RegisteredOptions(const RegisteredOptions&) = delete;
+    RegisteredOptions& operator=(const RegisteredOptions&) = delete;
+    ~RegisteredOptions() { MWUnregisterOptions(set_); }
+
+    uint32_t Set() const { return set_; }
+
+private:
+    const uint32_t set_;
+};
+
 /// What a test writes, with the defaults of most tests.
 struct TestMovie {
     int width = 160;
@@ -58,6 +73,9 @@ struct TestMovie {
     bool hasAudio = true;
 
     static EncodeParam Param();
+
+    /// Names the options that the file is to have.
+    void Use(const RegisteredOptions& options) { param.nReserved[kWriterSetWord] = options.Set(); }
 
     VideoFormat Video() const { return {width, height, rate, pictures / rate}; }
     AudioFormat Audio() const {

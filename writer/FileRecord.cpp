@@ -1,23 +1,18 @@
-#include "writer/StatusBoard.h"
+#include "writer/FileRecord.h"
 
 #include "log/dyLog.h"
 #include "text/Utf8.h"
 
-#include <algorithm>
 #include <array>
 #include <cstdarg>
 #include <cstdio>
 #include <exception>
 
 namespace writer {
-namespace {
 
-constexpr size_t kRemembered = 64;
-
-} // namespace
-
-FileRecord::FileRecord(int sequence, std::string_view path, const WriterOptions& options)
+FileRecord::FileRecord(uint32_t set, int sequence, std::string_view path, const WriterOptions& options)
     : sequence_(sequence), options_(options) {
+    status_.nSet = set;
     status_.nSequence = sequence;
     status_.nState = kWriterFileWriting;
     CopyText(status_.szPath, sizeof status_.szPath, path);
@@ -68,63 +63,6 @@ bool FileRecord::AskAboutFullDisk() const {
         return false;
     const WriterStatus status = Snapshot();
     return options_.pfnFullDisk(options_.pContext, &status) != 0;
-}
-
-StatusBoard& StatusBoard::Instance() {
-    static StatusBoard board;
-    return board;
-}
-
-void StatusBoard::SetOptions(const WriterOptions& options) {
-    const std::lock_guard lock(mutex_);
-    options_ = options;
-}
-
-WriterOptions StatusBoard::Options() const {
-    const std::lock_guard lock(mutex_);
-    return options_;
-}
-
-std::shared_ptr<FileRecord> StatusBoard::Open(std::string_view path) {
-    const std::lock_guard lock(mutex_);
-    auto record = std::make_shared<FileRecord>(count_ + 1, path, options_);
-    records_.push_back(record);
-    ++count_;
-    ForgetOld();
-    return record;
-}
-
-int StatusBoard::Count() const {
-    const std::lock_guard lock(mutex_);
-    return count_;
-}
-
-std::shared_ptr<const FileRecord> StatusBoard::Find(int sequence) const {
-    const std::lock_guard lock(mutex_);
-    const auto found = std::find_if(records_.begin(), records_.end(), [sequence](const auto& record) {
-        return record->Sequence() == sequence;
-    });
-    return found == records_.end() ? nullptr : *found;
-}
-
-std::shared_ptr<const FileRecord> StatusBoard::LastFailure() const {
-    const std::lock_guard lock(mutex_);
-    const auto found =
-        std::find_if(records_.rbegin(), records_.rend(), [](const auto& record) { return record->Failed(); });
-    return found == records_.rend() ? nullptr : *found;
-}
-
-void StatusBoard::ForgetOld() {
-    auto closed = static_cast<size_t>(std::count_if(records_.begin(), records_.end(),
-                                                    [](const auto& record) { return !record->IsOpen(); }));
-    for (auto record = records_.begin(); closed > kRemembered && record != records_.end();) {
-        if ((*record)->IsOpen()) {
-            ++record;
-        } else {
-            record = records_.erase(record);
-            --closed;
-        }
-    }
 }
 
 void WriteLog(const char* format, ...) noexcept {
