@@ -19,7 +19,7 @@ namespace {
 constexpr double kTickSeconds = 0.5;
 constexpr std::chrono::seconds kSuspicious{2}; // between two ticks: the process was suspended
 constexpr double kMostPercent = 99.9;          // until the file has its name
-constexpr double kEarlyEnd = 1; // seconds by which a source may fall short of its announced length
+constexpr double kEarlyEnd = 1; // seconds by which a source may fall short of the length asked for
 
 /// Whether the file is shorter than when it was opened.
 bool HasShrunk(const SourceInfo& source) {
@@ -273,8 +273,8 @@ std::optional<Failure> Conversion::Verdict() {
                        reason.empty() ? fmt::format("\"{}\" holds nothing to convert", options_.input)
                                       : fmt::format("cannot read \"{}\": {}", options_.input, reason));
     }
-    if (reason.empty() && EndedEarly() && HasShrunk(movie_.Info()))
-        reason = "the file was cut meanwhile";
+    if (reason.empty())
+        reason = WhyItEndedEarly();
     if (!reason.empty() && !userStopped_) {
         return Failure(ExitCode::kCannotRead,
                        fmt::format("reading \"{}\" failed after {}: {}; what was read is converted",
@@ -288,19 +288,25 @@ std::optional<Failure> Conversion::Verdict() {
     return std::nullopt;
 }
 
-bool Conversion::EndedEarly() const {
-    return outcome_ == kOutcomeCompleted && movie_.Info().certainty == Certainty::kKnown &&
-           length_ - std::max(position_.load(), movie_.SoundSeconds()) > kEarlyEnd;
+/// Why the source ended before what it promises, and before the length that was asked for; empty when it did
+/// not.
+std::string Conversion::WhyItEndedEarly() const {
+    const std::optional<Shortfall> missing = movie_.Missing();
+    const double converted = std::max(position_.load(), movie_.SoundSeconds());
+    const bool lengthReached = options_.length && length_ - converted <= kEarlyEnd;
+    if (!missing || lengthReached || outcome_ != kOutcomeCompleted)
+        return {};
+    if (HasShrunk(movie_.Info()))
+        return "the file was cut meanwhile";
+    if (missing->announced <= 0)
+        return "it is cut off";
+    return fmt::format("{}it ends at {} although it announces {}", missing->cutOff ? "it is cut off: " : "",
+                       FormatTime(missing->reached, true), FormatTime(missing->announced, true));
 }
 
 void Conversion::ReportComplaints() {
     for (const std::string& complaint : movie_.Complaints())
         reporter_.Warning(fmt::format("\"{}\": {}", options_.input, complaint));
-    if (EndedEarly()) {
-        reporter_.Warning(fmt::format("\"{}\" ended after {} although it announces {}", options_.input,
-                                      FormatTime(options_.begin + position_, true),
-                                      FormatTime(movie_.Info().duration, true)));
-    }
 }
 
 } // namespace movieconv

@@ -59,7 +59,7 @@ private:
     ExitCode Conclude();
     std::optional<Failure> Verdict();
     double Converted(double position) const;
-    bool EndedEarly() const;
+    std::string WhyItEndedEarly() const;
     void ReportComplaints();
 
     const Options& options_;

@@ -81,6 +81,8 @@ int CompanionFiles::OnOpen(AVFormatContext* context, AVIOContext** io, const cha
             self.refusal_ = refusal.what();
         return AVERROR(EACCES);
     } catch (const std::system_error& error) {
+        if (self.refusal_.empty())
+            self.refusal_ = fmt::format("it names \"{}\": {}", url, error.code().message());
         return AVERROR(error.code().value());
     } catch (const std::bad_alloc&) {
         return AVERROR(ENOMEM);

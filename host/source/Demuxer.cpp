@@ -146,6 +146,12 @@ std::string Demuxer::ReadError() const {
     return readError_;
 }
 
+std::optional<int64_t> Demuxer::EndOf(int stream) const {
+    const std::lock_guard lock(mutex_);
+    const auto found = queues_.find(stream);
+    return found != queues_.end() ? found->second.end : std::nullopt;
+}
+
 int Demuxer::ClockJumps() const {
     const std::lock_guard lock(mutex_);
     return clockJumps_;
@@ -196,6 +202,8 @@ bool Demuxer::ReadOne() {
         const std::lock_guard lock(mutex_);
         if (result != AVERROR_EOF && !stopping_)
             readError_ = av::ErrorText(result);
+        else if (!stopping_ && readError_.empty())
+            readError_ = source_.Refusal();
         return false;
     }
     failedReads_ = 0;
@@ -204,12 +212,21 @@ bool Demuxer::ReadOne() {
         return true;
     RepairClock(*packet);
     {
+        const std::optional<int64_t> end = EndOf(*packet);
         const std::lock_guard lock(mutex_);
+        found->second.end = std::max(found->second.end, end); // nothing is less than any
         found->second.bytes += static_cast<std::size_t>(packet->size);
         found->second.packets.push_back(std::move(packet));
     }
     changed_.notify_all();
     return true;
+}
+
+std::optional<int64_t> Demuxer::EndOf(const AVPacket& packet) const {
+    const int64_t stamp = packet.pts != AV_NOPTS_VALUE ? packet.pts : packet.dts;
+    if (stamp == AV_NOPTS_VALUE)
+        return std::nullopt;
+    return source_.MediaTime(stamp + packet.duration, source_.Context()->streams[packet.stream_index]);
 }
 
 /// Recordings joined end to end start a new clock in the middle. From there on the stamps of all streams are

@@ -14,6 +14,7 @@
 #include <exception>
 #include <map>
 #include <mutex>
+#include <optional>
 #include <string>
 #include <thread>
 
@@ -53,6 +54,9 @@ public:
     /// What ended the reading early; empty when it came to the end of the file.
     std::string ReadError() const;
 
+    /// Where the last packet of a stream ends that was read so far, in media time; nothing without one.
+    std::optional<int64_t> EndOf(int stream) const;
+
     /// Times that the source's clock jumped and was put right.
     int ClockJumps() const;
 
@@ -60,6 +64,7 @@ private:
     struct Queue {
         std::deque<av::Packet> packets;
         std::size_t bytes = 0;
+        std::optional<int64_t> end; // in media time, of what was read
     };
 
     void Start();
@@ -71,6 +76,7 @@ private:
     bool KeyPictureAtOrBefore(int64_t mediaTime);
     bool Holds(std::size_t packets, std::size_t bytes) const;
     void RepairClock(AVPacket& packet);
+    std::optional<int64_t> EndOf(const AVPacket& packet) const;
 
     Source& source_;
     double soughtSeconds_ = -1;

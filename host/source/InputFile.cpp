@@ -68,6 +68,10 @@ int InputFile::Read(uint8_t* data, int size) const {
     }
 }
 
+int InputFile::ReadAt(int64_t offset, uint8_t* data, std::size_t size) const {
+    return static_cast<int>(pread(file_.Number(), data, size, offset));
+}
+
 int64_t InputFile::Seek(int64_t offset, int whence) const {
     if (whence == AVSEEK_SIZE)
         return size_;

@@ -5,6 +5,7 @@
 #include "ffmpeg/AvHandles.h"
 
 #include <atomic>
+#include <cstddef>
 #include <cstdint>
 #include <string>
 
@@ -24,6 +25,10 @@ public:
 
     /// Bytes in a regular file; 0 for anything else, which cannot be sought either.
     int64_t Size() const { return size_; }
+
+    /// Reads at a place of a regular file without moving there, for who looks at its structure. The number of
+    /// bytes, fewer than asked for at the file's end; negative when reading fails.
+    int ReadAt(int64_t offset, uint8_t* data, std::size_t size) const;
 
     /// Makes every read fail from now on, also one that is under way.
     void Interrupt();

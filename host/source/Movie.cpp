@@ -1,5 +1,7 @@
 #include "host/source/Movie.h"
 
+#include "host/source/MediaTime.h"
+
 #include <fmt/format.h>
 
 namespace movieconv {
@@ -22,6 +24,18 @@ void Movie::Stop() {
         pictures_->Stop();
     if (sound_)
         sound_->Stop();
+}
+
+std::optional<Shortfall> Movie::Missing() const {
+    const auto reached = [&](const AVStream* stream) {
+        return ToSeconds(demuxer_.EndOf(stream->index).value_or(0));
+    };
+    Reached ends;
+    if (pictures_ && pictures_->RanDry())
+        ends.pictures = reached(source_.PictureStream());
+    if (sound_ && sound_->RanDry())
+        ends.sound = reached(source_.SoundStream());
+    return FindShortfall(Info().promise, ends);
 }
 
 std::vector<std::string> Movie::Complaints() const {

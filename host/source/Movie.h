@@ -8,6 +8,7 @@
 #include "host/source/Source.h"
 
 #include <memory>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -39,6 +40,10 @@ public:
 
     /// Why reading ended before the end of the source; empty when it did not. Any thread.
     std::string ReadError() const { return demuxer_.ReadError(); }
+
+    /// What the source promises and does not hold, of the streams that were taken to their end; nothing when
+    /// it holds all. Once both streams ended.
+    std::optional<Shortfall> Missing() const;
 
     /// What was wrong with the movie and has been put right or skipped, a sentence each. Once both streams
     /// ended.

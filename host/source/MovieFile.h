@@ -4,6 +4,7 @@
 
 #include "ffmpeg/AvHandles.h"
 #include "host/source/CompanionFiles.h"
+#include "host/source/Completeness.h"
 #include "host/source/InputFile.h"
 
 #include <cstdint>
@@ -28,6 +29,12 @@ public:
 
     /// Whether the bytes come from several files, of which only the one that names them is counted.
     bool IsPlaylist() const;
+
+    /// Whether the file promises more than it holds.
+    bool IsCutOff() const { return movieconv::IsCutOff(bytes_, *input_); }
+
+    /// Why a file that the source names was not read; empty when all were.
+    const std::string& Refusal() const { return companions_.Refusal(); }
 
     /// Makes every read fail from now on, also one that is under way.
     void Interrupt() { bytes_.Interrupt(); }

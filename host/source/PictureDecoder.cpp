@@ -114,6 +114,7 @@ void PictureDecoder::Run() {
         if (const auto last = stamps_.Finish(); last && held_)
             Deliver(*last);
     });
+    ranDry_ = !refused_;
     repaired_ = stamps_.Repaired();
     damaged_ = damagedBefore_ + decoder_->Damaged();
     queue_.Finish();
@@ -154,8 +155,10 @@ bool PictureDecoder::Accept(AVFrame& frame) {
 /// Hands the held picture on, unless it is over before the conversion begins. False when that ends before it,
 /// or nobody takes it any more.
 bool PictureDecoder::Deliver(StampRepair::Stamp stamp) {
-    if (end_ && stamp.time >= *end_)
+    if (end_ && stamp.time >= *end_) {
+        refused_ = true;
         return false;
+    }
     if (begin_ && stamp.time + stamp.duration <= *begin_)
         return true;
     if (const int64_t begin = begin_.value_or(0); first_ && (begin_ || stamp.time > begin)) {
@@ -173,7 +176,8 @@ bool PictureDecoder::Deliver(StampRepair::Stamp stamp) {
     else if (pushed_ > kWarmUpPictures && queue_.Size() == 0)
         ++starved_;
     const std::size_t bytes = Bytes(*picture);
-    return queue_.Push({std::move(picture), stamp}, bytes);
+    refused_ = !queue_.Push({std::move(picture), stamp}, bytes);
+    return !refused_;
 }
 
 /// Unless the stream is heavy, one thread decodes at first. It costs the least and is mostly enough: the

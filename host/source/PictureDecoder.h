@@ -44,6 +44,9 @@ public:
     int64_t Damaged() const { return damaged_; }
     int64_t Repaired() const { return repaired_; }
 
+    /// Whether the source's last picture has been decoded and handed on. Any thread.
+    bool RanDry() const { return ranDry_; }
+
     /// The picture handed out last, null without one. Once the conversion has ended.
     const VideoImage* Last() const { return current_.frame ? &image_ : nullptr; }
 
@@ -78,6 +81,7 @@ private:
     int64_t decoded_ = 0;
     int64_t skip_ = 0; // frames that a restarted decoder gives once more
     bool first_ = true;
+    bool refused_ = false; // nobody takes pictures any more
     int pushed_ = 0;
     int starved_ = 0;
     ProcessorUse use_; // since the warm-up, of the decoding thread
@@ -87,6 +91,7 @@ private:
     BoundedQueue<Picture> queue_;
     std::atomic<int64_t> damaged_{0};
     std::atomic<int64_t> repaired_{0};
+    std::atomic<bool> ranDry_{false};
     std::thread thread_;
 
     // The engine worker's.

@@ -110,6 +110,7 @@ AudioFrame* SoundDecoder::GetNextFrame() {
 void SoundDecoder::Run() {
     timeline_.emplace(info_.format.nSampleRate, begin_);
     demuxer_.Attempt([this] { DecodeAll(); });
+    ranDry_ = !refused_;
     corrections_ = timeline_->Corrections();
     queue_.Finish();
 }
@@ -198,7 +199,8 @@ bool SoundDecoder::PushSilence(int64_t samples) {
 
 bool SoundDecoder::Push(Chunk chunk) {
     const std::size_t bytes = chunk.size();
-    return bytes == 0 || queue_.Push(std::move(chunk), bytes);
+    refused_ = bytes > 0 && !queue_.Push(std::move(chunk), bytes);
+    return !refused_;
 }
 
 } // namespace movieconv

@@ -35,6 +35,9 @@ public:
     int Corrections() const { return corrections_; }
     double SecondsDelivered() const;
 
+    /// Whether the source's last sound has been decoded and handed on. Any thread.
+    bool RanDry() const { return ranDry_; }
+
 private:
     using Chunk = std::vector<uint8_t>; // whole samples in the engine's form
 
@@ -61,12 +64,14 @@ private:
     av::ChannelLayout outputLayout_;
     av::Frame inputForm_; // format, rate and layout that the resampler is made for
     std::optional<SoundTimeline> timeline_;
+    bool refused_ = false;      // nobody takes sound any more
     int64_t damagedBefore_ = 0; // the begin, where a seek may land amid a frame
 
     // Between the threads.
     BoundedQueue<Chunk> queue_;
     std::atomic<int64_t> damaged_{0};
     std::atomic<int> corrections_{0};
+    std::atomic<bool> ranDry_{false};
     std::atomic<int64_t> samplesDelivered_{0};
     std::thread thread_;
 

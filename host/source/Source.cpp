@@ -10,6 +10,7 @@
 extern "C" {
 #include <libavutil/avstring.h>
 #include <libavutil/display.h>
+#include <libavutil/parseutils.h>
 #include <libavutil/pixdesc.h>
 }
 
@@ -51,6 +52,16 @@ double ToldFrameRate(const AVStream* stream) {
 /// Matroska and NUT announce where the movie ends on its clock, all others how long it is.
 bool AnnouncesItsEnd(const AVInputFormat& format) {
     return av_match_name("matroska", format.name) != 0 || av_match_name("nut", format.name) != 0;
+}
+
+/// Where a stream of Matroska ends by the tag that its writer left, in seconds from the start of the source;
+/// 0 without one.
+double TaggedEnd(const AVStream* stream, double start) {
+    const AVDictionaryEntry* tag = av_dict_get(stream->metadata, "DURATION", nullptr, 0);
+    int64_t microseconds = 0;
+    return tag != nullptr && av_parse_time(&microseconds, tag->value, 1) >= 0
+               ? static_cast<double>(microseconds) / AV_TIME_BASE - start
+               : 0;
 }
 
 /// Reads the turn that brings the stored picture upright from the container's display matrix.
@@ -255,6 +266,7 @@ void Source::FindDuration() {
             duration = whole;
         info_.duration = std::max(info_.duration, duration);
     };
+    FindPromise(measured);
     info_.duration = 0;
     if (info_.pictures)
         complete(info_.pictures->duration);
@@ -263,6 +275,35 @@ void Source::FindDuration() {
         if (info_.sound->duration < kShortestStream && info_.pictures)
             info_.sound.reset();
     }
+}
+
+/// Takes down what the container announces about the streams that are converted.
+void Source::FindPromise(bool measured) {
+    Promise& promise = info_.promise;
+    promise.cutOff = file_->IsCutOff();
+    // Where the last stamps were looked up, or the clock may start anew, nothing was announced.
+    const bool announced = !measured && (Context()->iformat->flags & AVFMT_TS_DISCONT) == 0 &&
+                           Context()->duration_estimation_method == AVFMT_DURATION_FROM_STREAM;
+    if (!announced)
+        return;
+    const auto announcedEnd = [&](const AVStream* stream) {
+        const double own = EndOf(stream) > 0 ? EndOf(stream) : TaggedEnd(stream, ToSeconds(start_));
+        return own > 0 && own < info_.duration + 1 ? std::optional(own) : std::nullopt;
+    };
+    bool othersMayBeLonger = false;
+    for (unsigned i = 0; i < Context()->nb_streams; ++i) {
+        const AVStream* stream = Context()->streams[i];
+        const bool timed = stream->codecpar->codec_type != AVMEDIA_TYPE_ATTACHMENT &&
+                           (stream->disposition & AV_DISPOSITION_ATTACHED_PIC) == 0;
+        othersMayBeLonger =
+            othersMayBeLonger || (timed && stream != PictureStream() && stream != SoundStream());
+    }
+    if (info_.pictures)
+        promise.pictures = announcedEnd(PictureStream());
+    if (info_.sound)
+        promise.sound = announcedEnd(SoundStream());
+    if (!othersMayBeLonger && !promise.pictures && !promise.sound)
+        promise.all = info_.duration;
 }
 
 /// Finds out by reading the end of the file how long it is, and its beginning too where the stamps are

@@ -3,6 +3,7 @@
 #define MOVIECONV_HOST_SOURCE_SOURCE_H
 
 #include "ffmpeg/AvHandles.h"
+#include "host/source/Completeness.h"
 #include "host/source/MovieFile.h"
 #include "host/source/SourceError.h"
 
@@ -54,6 +55,7 @@ struct SourceInfo {
     Certainty certainty = Certainty::kKnown; ///< Of `duration`.
     std::optional<PictureStreamInfo> pictures;
     std::optional<SoundStreamInfo> sound;
+    Promise promise;
 };
 
 struct SourceChoice {
@@ -82,6 +84,9 @@ public:
     /// False for a pipe: trying to seek would lose what was read ahead.
     bool IsSeekable() const;
 
+    /// Why a file that the source names was not read; empty when all were. The reading thread's.
+    const std::string& Refusal() const { return file_->Refusal(); }
+
     /// Goes back to the first packet. False when it fails; where the source is then is not known.
     bool Rewind();
 
@@ -108,6 +113,7 @@ private:
     void FindFrameRate();
     double CountFrameRate();
     void FindDuration();
+    void FindPromise(bool measured);
     void MeasureDuration();
     Stretch ReadStretch(int64_t mostBytes, int mostPackets = std::numeric_limits<int>::max());
     void ReturnToBegin();
