@@ -2,6 +2,7 @@
 
 #include "engine/ConvThread.h"
 #include "engine/Estimate.h"
+#include "engine/FileParam.h"
 #include "engine/WriterCalls.h"
 #include "log/dyLog.h"
 
@@ -75,6 +76,16 @@ MCHandle MCCreate(VideoDecoder* video, AudioDecoder* audio) {
     }
 }
 
+MCHandle MCCreateFromSources(const MCVideoSource* video, const MCAudioSource* audio) {
+    if ((!video && !audio) || !WriterFits())
+        return nullptr;
+    try {
+        return ConvThread::FromSources(video, audio).release();
+    } catch (...) {
+        return nullptr;
+    }
+}
+
 void MCDestroy(MCHandle converter) {
     if (RefusedOnWorker(converter, L"MCDestroy"))
         return;
@@ -87,6 +98,10 @@ int MCSetEncodeParam(MCHandle converter, const EncodeParam* param) {
 
 int MCGetEncodeParam(MCHandle converter, EncodeParam* out) {
     return Call(converter, 0, [=](ConvThread& c) { return c.GetEncodeParam(out); });
+}
+
+int MCEncodeParamForFile(const wchar_t* fileName, EncodeParam* param) {
+    return ParamForFile(fileName, param) ? 1 : 0;
 }
 
 int MCSetOutputFile(MCHandle converter, const wchar_t* path) {
@@ -149,6 +164,14 @@ int MCWait(MCHandle converter, unsigned timeoutMs) {
 
 int MCSetThreadPriority(MCHandle /*converter*/, int /*priority*/) {
     return 0;
+}
+
+int MCGetResult(MCHandle converter, MCResult* result) {
+    return Call(converter, 0, [=](ConvThread& c) { return c.GetResult(result); });
+}
+
+unsigned MCEnableStopOnFailure(MCHandle converter, unsigned enable) {
+    return Call(converter, 0U, [=](ConvThread& c) { return c.EnableStopOnFailure(enable); });
 }
 
 int MCGetTargetCount(MCHandle converter) {

@@ -29,10 +29,12 @@
 #include "api/LogCallback.h"
 #include "api/Version.h"
 #include "engine/ProgressInfo.h"
+#include "engine/Result.h"
 #include "media/EncodeParam.h"
 #include "media/FourCC.h"
 #include "media/MediaRecords.h"
 #include "media/ProgressCallback.h"
+#include "media/Sources.h"
 #include "platform/Platform.h"
 
 #include <wchar.h>
@@ -69,17 +71,38 @@ unsigned MCGetVersion(void);
 /// media writer beside the engine is of another major version.
 MCHandle MCCreate(VideoDecoder* video, AudioDecoder* audio);
 
+/// The same from tables of functions, for hosts in C and in languages that call C. Either may be null. Null
+/// when both are, when there is no memory, and with a line in the log when a table is not complete, a source
+/// cannot be described, or the media writer does not fit.
+MCHandle MCCreateFromSources(const MCVideoSource* video, const MCAudioSource* audio);
+
 /// Stops a running conversion, waits for its end and frees the converter. Null does nothing, and neither does
 /// a call inside the converter's own callback.
 void MCDestroy(MCHandle converter);
 
 // ---- Before a conversion
 
-/// Sets the encoding parameters. For the streams that the source has, a picture size, frame rate, sample
-/// rate, channel count or sample size of 0 becomes the source's, and a bit rate of 0 becomes 512 kbit/s for
-/// pictures, 64 kbit/s for sound. A stream that the file format cannot carry is switched off. A frame rate
-/// above 200 becomes 30 when there is a video decoder. Null completes the parameters that are set. Always 1.
+/// Sets the encoding parameters. What is 0 in them is completed as follows, and nothing else is:
+///
+/// - with a video decoder that describes its source: nWidth, nHeight and dFrameRate (a negative one too)
+///   become the source's, nVideoBitrate becomes 512000;
+/// - with an audio decoder that does: nSampleRate, nChannels and nBitsPerSample become the source's,
+///   nAudioBitrate becomes 64000.
+///
+/// Codecs, picture format and file format stay 0, for which the media writer has no file: take the record of
+/// MCGetEncodeParam or MCEncodeParamForFile and change that. A stream that the file format cannot carry is
+/// switched off, and is not switched on again by a later call. A frame rate above 200 becomes 30 when there
+/// is a video decoder. Null completes the parameters that are set. Always 1.
 int MCSetEncodeParam(MCHandle converter, const EncodeParam* param);
+
+/// Fills in parameters for a file of that name: the file format by the name's extension, in capitals or not,
+/// whatever else the name holds; the codecs H.264 and AAC where the format carries them, else those that it
+/// lists first; bit rates of 4 Mbit/s and 160 kbit/s, which suit high definition; 4:2:0 pictures. Size, rates
+/// and channels are 0, so that MCSetEncodeParam takes them from the source. A stream that the format cannot
+/// carry is switched off.
+///
+/// 1; 0 with `param` untouched for an extension that the media writer does not know, and for null.
+int MCEncodeParamForFile(const wchar_t* fileName, EncodeParam* param);
 
 /// Copies the parameters in force to `out`, if it is not null. A stream that the last conversion did not find
 /// is switched off in them. Always 1.
@@ -154,6 +177,20 @@ int MCWait(MCHandle converter, unsigned timeoutMs);
 
 /// Does nothing: the worker's priority is never changed. Always 0.
 int MCSetThreadPriority(MCHandle converter, int priority);
+
+// ---- What has become of it
+
+/// Copies how the converter's last conversion stands, which MCStart began. May be called at any time, also
+/// from the callback; complete once MCWait or MCStop has returned. A record of an older program is filled as
+/// far as it goes.
+///
+/// 1; 0 for null and for a record whose nSize is less than that of version 1.1.
+int MCGetResult(MCHandle converter, MCResult* result);
+
+/// Nonzero: a conversion ends as MCAbort ends it, with kOutcomeStopped, as soon as the writer fails or does
+/// not take something; MCGetResult tells why. Zero, as at first: it goes on to the end of the source. Takes
+/// effect at once, also while running. Returns `enable`.
+unsigned MCEnableStopOnFailure(MCHandle converter, unsigned enable);
 
 // ---- Clips
 

@@ -3,7 +3,6 @@
 #include "engine/Conversion.h"
 #include "engine/SourceFormat.h"
 #include "log/dyLog.h"
-#include "media/MediaWriter.h"
 #include "thread/Clock.h"
 
 namespace {
@@ -40,15 +39,15 @@ int ConvThread::AudioLoop::Run() {
     pAudioFormat = SourceFormat(converter.pAudioDecoder);
     if (!pAudioFormat || pAudioFormat->dDuration < kMinDuration) {
         LogAt(kLogError, L"MovieConv::Without audio decoder or zero length.");
-        return ReportFailure();
+        return ReportFailure(MC_RESULT_SOURCE, "There is no sound to convert.");
     }
     if (!CreateFile(converter.strOutputFile.c_str()))
-        return ReportFailure();
-    converter.pAudioDecoder->Seek(BeginTime());
-    StartClock();
-
-    const unsigned outcome = Iterate();
-
+        return ReportFailure(MC_RESULT_CANNOT_OPEN, "");
+    const unsigned outcome = Guarded([this] {
+        converter.pAudioDecoder->Seek(BeginTime());
+        StartClock();
+        return Iterate();
+    });
     return Finish(outcome, converter.dLength);
 }
 
@@ -60,7 +59,7 @@ unsigned ConvThread::AudioLoop::Iterate() {
         if (!block || block->nLength == 0 || LengthReached())
             return kOutcomeCompleted;
 
-        MWWriteAudioData(hFile, block);
+        Send(*block);
         Count(block->nLength);
 
         const uint32_t now = MillisecondClock();

@@ -3,18 +3,20 @@
 // block before it was. Where the sound has ended, silence takes its place.
 #include "engine/Arithmetic.h"
 #include "engine/Conversion.h"
+#include "engine/SoundClock.h"
 #include "engine/SourceFormat.h"
 #include "log/dyLog.h"
-#include "media/MediaWriter.h"
 #include "thread/Clock.h"
 
 #include <algorithm>
+#include <cstdlib>
 #include <new>
 
 namespace {
 
 constexpr int32_t kSilenceStep = 400000; // 40 ms
 constexpr int32_t kSilenceSize = 1 << 20;
+constexpr int64_t kShiftTold = 100000; // 10 ms
 
 /// Iterations between two progress notifications.
 int32_t NotifyInterval(int32_t totalFrames) {
@@ -30,7 +32,9 @@ public:
     int Run();
 
 private:
+    void Begin();
     unsigned Iterate();
+    void TellShift();
     void WriteSound(const VideoImage* picture);
     void WriteBlock(const AudioFrame& block, int64_t pictureTime);
     bool WriteSilence(const VideoImage* picture);
@@ -56,6 +60,7 @@ private:
     int64_t llVideoShift = 0;   // from source to output
     int64_t llAudioBytes = 0;   // sound in the current file
 
+    SoundClock clock;
     std::unique_ptr<unsigned char[]> silence;
 };
 
@@ -66,8 +71,21 @@ int ConvThread::process() {
 int ConvThread::AudioVideoLoop::Run() {
     pVideoFormat = SourceFormat(converter.pVideoDecoder);
     pAudioFormat = SourceFormat(converter.pAudioDecoder);
-    if (!pVideoFormat || !pAudioFormat || !CreateFirstFile())
-        return ReportFailure();
+    if (!pVideoFormat || !pAudioFormat)
+        return ReportFailure(MC_RESULT_SOURCE, "A source does not describe itself any more.");
+    if (!CreateFirstFile())
+        return ReportFailure(MC_RESULT_CANNOT_OPEN, "");
+    const unsigned outcome = Guarded([this] {
+        Begin();
+        return Iterate();
+    });
+
+    silence.reset();
+    TellShift();
+    return Finish(outcome, converter.dConvLength);
+}
+
+void ConvThread::AudioVideoLoop::Begin() {
     const double begin = BeginTime();
     if (begin > 0.0) {
         converter.pVideoDecoder->Seek(begin, 1);
@@ -77,11 +95,6 @@ int ConvThread::AudioVideoLoop::Run() {
     nTotalFrames = Truncate<int32_t>(dSourceRate * converter.dConvLength + 0.5);
     nNotifyInterval = NotifyInterval(nTotalFrames);
     StartClock();
-
-    const unsigned outcome = Iterate();
-
-    silence.reset();
-    return Finish(outcome, converter.dConvLength);
 }
 
 unsigned ConvThread::AudioVideoLoop::Iterate() {
@@ -142,12 +155,13 @@ void ConvThread::AudioVideoLoop::WriteBlock(const AudioFrame& block, int64_t pic
     AudioFrame copy = block;
     copy.llTime2 = llAudioOut;
     copy.llTime = llAudioOut;
-    MWWriteAudioData(hFile, &copy);
+    Send(copy);
 
     llAudioSrc = block.llTime;
     llVideoShift = WrapSub(llAudioOut, llAudioSrc);
     llAudioBytes = WrapAdd<int64_t>(llAudioBytes, block.nLength);
     const int32_t bytesPerSecond = pAudioFormat->nBytesPerSecond;
+    clock.Add(block.llTime, block.nLength, bytesPerSecond);
     llAudioOut = llAudioOrigin;
     if (bytesPerSecond > 0) { // bytes of no known rate take no time
         dPosition += static_cast<double>(block.nLength) / bytesPerSecond;
@@ -166,6 +180,7 @@ bool ConvThread::AudioVideoLoop::WriteSilence(const VideoImage* picture) {
         silence.reset(new (std::nothrow) unsigned char[kSilenceSize]());
         if (!silence) {
             LogAt(kLogError, L"MovieConv::No memory for silence.\r\n");
+            converter.results.Fail(MC_RESULT_INTERNAL, "There was no memory for silence.");
             return false;
         }
     }
@@ -193,7 +208,7 @@ void ConvThread::AudioVideoLoop::WriteSilentBlocks(int32_t gap) {
                              param.nChannels * param.nBitsPerSample * 0.125;
         block.nLength = std::clamp(Truncate<int32_t>(bytes + 0.5), 0, kSilenceSize);
         block.nDuration = step;
-        MWWriteAudioData(hFile, &block);
+        Send(block);
         llAudioBytes += block.nLength;
         block.llTime2 = WrapAdd<int64_t>(block.llTime2, step);
         block.llTime = WrapAdd<int64_t>(block.llTime, step);
@@ -207,7 +222,29 @@ void ConvThread::AudioVideoLoop::WritePicture(const VideoImage& picture) {
     VideoImage copy = picture;
     copy.llTime2 = WrapAdd(copy.llTime2, llVideoShift);
     copy.llTime = WrapAdd(copy.llTime, llVideoShift);
-    MWWriteVideoFrame(hFile, &copy);
+    Send(copy);
+
+    const int64_t shift = clock.Shift();
+    if (std::abs(shift) <= kShiftTold)
+        return;
+    converter.results.Update([shift](MCResult& result) {
+        ++result.llPicturesRestamped;
+        if (std::abs(shift) > std::abs(result.llLargestShift))
+            result.llLargestShift = shift;
+    });
+}
+
+void ConvThread::AudioVideoLoop::TellShift() {
+    MCResult result{};
+    result.nSize = sizeof result;
+    if (!converter.results.Copy(&result) || result.llPicturesRestamped == 0)
+        return;
+    LogAt(
+        kLogWarning,
+        L"MovieConv::Sound is the clock: %lld pictures were moved, by up to %0.3fs, since blocks of sound do "
+        L"not follow each other as their stamps say.\r\n",
+        static_cast<long long>(result.llPicturesRestamped),
+        static_cast<double>(result.llLargestShift) / kTicksPerSecond);
 }
 
 void ConvThread::AudioVideoLoop::Estimate(uint32_t now) {

@@ -37,12 +37,14 @@ wchar_t* ConvThread::CreateNewClip() {
         auto name = std::make_unique<wchar_t[]>(kClipNameSize);
         if (!FormatClipName(name.get(), strOutputFile, vecTargetNames.size())) {
             LogAt(kLogError, L"MovieConv::CreateNewClip(): output name too long for clips.\r\n");
+            results.Fail(MC_RESULT_PARAMETERS, "The output's name is too long for the names of clips.");
             return nullptr;
         }
         const CSingleLock guard(&sharedLock);
         return vecTargetNames.emplace_back(std::move(name)).get();
     } catch (const std::exception&) {
         LogAt(kLogError, L"MovieConv::CreateNewClip(): no memory for a clip name.\r\n");
+        results.Fail(MC_RESULT_INTERNAL, "There was no memory for the name of a clip.");
         return nullptr;
     }
 }

@@ -1,5 +1,6 @@
 // Starting, steering and ending a conversion, and the worker's choice of a loop.
 #include "engine/ConvThread.h"
+#include "engine/Conversion.h"
 #include "engine/ProgressInfo.h"
 #include "engine/SourceFormat.h"
 #include "log/dyLog.h"
@@ -41,6 +42,7 @@ int ConvThread::Start(double begin, double length, OpaqueWindowPtr* window, Prog
                       void* context) {
     if (IsActive())
         return 0;
+    results.Begin();
     dBeginTime = begin;
     dLength = length;
     LogEx(L"MovieConv::StartThread(): BeginTime[%0.3fs], Length[%0.3fs]", begin, length);
@@ -56,6 +58,8 @@ int ConvThread::Start(double begin, double length, OpaqueWindowPtr* window, Prog
     LogEx(L"MovieConv::StartThread(): ConvLength[%0.3fs]", dLength);
     if (pVideoDecoder && !SourceFormat(pVideoDecoder)) {
         LogAt(kLogError, L"Failed to open file.\r\n");
+        results.Fail(MC_RESULT_SOURCE, "The picture source does not describe itself.");
+        results.End(kOutcomeFailed, false);
         return kCannotOpenSource;
     }
 
@@ -67,15 +71,28 @@ int ConvThread::Start(double begin, double length, OpaqueWindowPtr* window, Prog
     pfnProgress = callback;
     pProgressContext = context;
     LogEx(L"Encoding thread Starting .");
-    BaseThread::Start();
+    if (BaseThread::Start() == 0) {
+        results.Fail(MC_RESULT_INTERNAL, "No thread could be made for the conversion.");
+        results.End(kOutcomeFailed, false);
+    }
     return 0;
 }
 
 int ConvThread::svc() {
+    try {
+        Dispatch();
+    } catch (...) {
+        // A source that threw before there was a file.
+        Conversion(*this).ReportException();
+    }
+    LogEx(L"Encoding thread Exit.");
+    return 0;
+}
+
+void ConvThread::Dispatch() {
     if (!pVideoDecoder && !pAudioDecoder) {
         LogAt(kLogError, L"MovieConv::decoder is null");
-        if (pfnProgress)
-            pfnProgress(pProgressContext, 1, kOutcomeFailed, 0);
+        Conversion(*this).ReportFailure(MC_RESULT_SOURCE, "There is no source.", false);
     } else if (encodeParam.bNoVideo || IsEmpty(pVideoDecoder)) {
         Drop(pVideoDecoder, encodeParam.bNoVideo);
         process_audio_only();
@@ -85,8 +102,6 @@ int ConvThread::svc() {
     } else {
         process();
     }
-    LogEx(L"Encoding thread Exit.");
-    return 0;
 }
 
 template <class Decoder>
@@ -100,6 +115,14 @@ void ConvThread::Drop(Decoder*& decoder, int32_t& bNoStream) {
 
 unsigned ConvThread::EnablePreview(unsigned enable) {
     return bPreview = enable;
+}
+
+unsigned ConvThread::EnableStopOnFailure(unsigned enable) {
+    return bStopOnFailure = enable;
+}
+
+int ConvThread::GetResult(MCResult* out) const {
+    return results.Copy(out) ? 1 : 0;
 }
 
 unsigned ConvThread::EnableEvents(unsigned enable) {

@@ -7,6 +7,7 @@
 #include "thread/SingleLock.h"
 
 #include <new>
+#include <utility>
 
 namespace {
 
@@ -100,6 +101,21 @@ ConvThread::ConvThread(VideoDecoder* video, AudioDecoder* audio)
         encodeParam.nSampleRate = source->nSampleRate;
         encodeParam.nChannels = source->nChannels;
     }
+}
+
+std::unique_ptr<ConvThread> ConvThread::FromSources(const MCVideoSource* video, const MCAudioSource* audio) {
+    std::unique_ptr<SourceVideo> pictures = video ? SourceVideo::Make(video) : nullptr;
+    std::unique_ptr<SourceAudio> sound = audio ? SourceAudio::Make(audio) : nullptr;
+    if ((video && !pictures) || (audio && !sound))
+        return nullptr;
+    auto converter = std::make_unique<ConvThread>(pictures.get(), sound.get());
+    if (pictures)
+        pictures->JoinConverter(converter->results);
+    if (sound)
+        sound->JoinConverter(converter->results);
+    converter->ownVideo = std::move(pictures);
+    converter->ownAudio = std::move(sound);
+    return converter;
 }
 
 ConvThread::~ConvThread() {

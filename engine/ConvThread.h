@@ -2,6 +2,8 @@
 #ifndef MOVIECONV_ENGINE_CONVTHREAD_H
 #define MOVIECONV_ENGINE_CONVTHREAD_H
 
+#include "engine/ResultBook.h"
+#include "engine/SourceDecoders.h"
 #include "media/Decoders.h"
 #include "media/EncodeParam.h"
 #include "media/ProgressCallback.h"
@@ -34,6 +36,10 @@ public:
     ConvThread(VideoDecoder* video, AudioDecoder* audio);
     virtual ~ConvThread();
 
+    /// The converter over a host's tables; either may be null. Null, with a line in the log, when one makes
+    /// no sense or its source cannot be described. Throws std::bad_alloc.
+    static std::unique_ptr<ConvThread> FromSources(const MCVideoSource* video, const MCAudioSource* audio);
+
     int SetEncodeParam(const EncodeParam* param);
     int GetEncodeParam(EncodeParam* out) const;
     int SetOutputFile(const wchar_t* path);
@@ -46,6 +52,9 @@ public:
     int Resume();
     int Stop(unsigned, unsigned);
     int Abort(unsigned, unsigned);
+
+    int GetResult(MCResult* out) const;
+    unsigned EnableStopOnFailure(unsigned enable);
 
     int GetTargetCount() const;
     int GetTargetFileName(wchar_t* buffer, int index) const;
@@ -63,6 +72,9 @@ private:
     int process();
     int process_audio_only();
     int process_video_only();
+
+    /// Runs the loop that fits the streams.
+    void Dispatch();
 
     /// Switches the decoder's stream off, for this and every later run; an empty decoder is forgotten.
     template <class Decoder>
@@ -93,6 +105,10 @@ private:
     mutable pthread_mutex_t sharedLock = PTHREAD_MUTEX_INITIALIZER;
 
     std::atomic<uint32_t> bEvents{1};
+    std::atomic<uint32_t> bStopOnFailure{0};
+    ResultBook results;
+    std::unique_ptr<SourceVideo> ownVideo; // of a converter from tables
+    std::unique_ptr<SourceAudio> ownAudio;
 };
 
 #endif

@@ -2,19 +2,20 @@
 
 #include "engine/Arithmetic.h"
 #include "engine/PostMessage.h"
+#include "log/dyLog.h"
 #include "media/MediaWriter.h"
+#include "text/Utf8.h"
 #include "thread/Clock.h"
 
 #include <algorithm>
 #include <cmath>
+#include <cstdio>
+#include <exception>
+#include <new>
 
 namespace {
 
 constexpr int32_t kProgressComplete = 10000; // hundredths of a percent
-
-uintptr_t CallbackInfo(const ProgressInfo* info) {
-    return reinterpret_cast<uintptr_t>(info);
-}
 
 /// An estimate that there is no basis for yet is infinite or not a number; the host gets 0 instead.
 double FiniteOrZero(double value) {
@@ -24,8 +25,78 @@ double FiniteOrZero(double value) {
 } // namespace
 
 bool ConvThread::Conversion::CreateFile(const wchar_t* fileName) {
+    filePath = text::ToUtf8(fileName);
+    bFileEmpty = true;
     hFile = MWCreateMediaFile(fileName, &converter.encodeParam, pVideoFormat, pAudioFormat);
-    return hFile != nullptr;
+    if (hFile) {
+        converter.results.Update([](MCResult& result) { ++result.nFilesCreated; });
+        return true;
+    }
+    converter.results.Fail(MC_RESULT_CANNOT_OPEN, "The media writer could not create the file.",
+                           filePath.c_str());
+    StopAfterFailure();
+    return false;
+}
+
+void ConvThread::Conversion::CloseFile(ProgressCallback callback, void* context) {
+    const bool complete = MWCloseMediaFile(hFile, callback, context) != 0;
+    if (complete)
+        converter.results.Update([](MCResult& result) { ++result.nFilesComplete; });
+    else if (hFile && !bFileEmpty)
+        converter.results.Fail(MC_RESULT_WRITE, "The media writer could not complete the file.",
+                               filePath.c_str());
+    hFile = nullptr;
+}
+
+void ConvThread::Conversion::Send(const VideoImage& picture) {
+    const bool taken = MWWriteVideoFrame(hFile, &picture) != 0;
+    bFileEmpty = false;
+    converter.results.Update([taken](MCResult& result) {
+        ++result.llPicturesSent;
+        ++(taken ? result.llPicturesWritten : result.llPicturesRefused);
+    });
+    if (!taken)
+        NoteRefusal("The media writer did not take a picture.");
+}
+
+void ConvThread::Conversion::Send(const AudioFrame& block) {
+    const bool taken = MWWriteAudioData(hFile, &block) != 0;
+    if (block.nLength <= 0) // silence of no length
+        return;
+    bFileEmpty = false;
+    const int32_t frame = WrapMul(block.nChannels, block.nBitsPerSample) / 8;
+    const int32_t samples = frame > 0 ? block.nLength / frame : 0;
+    converter.results.Update([=](MCResult& result) {
+        result.llSamplesSent += samples;
+        (taken ? result.llSamplesWritten : result.llSamplesRefused) += samples;
+    });
+    if (!taken)
+        NoteRefusal("The media writer did not take a block of sound.");
+}
+
+void ConvThread::Conversion::NoteRefusal(const char* what) {
+    converter.results.Fail(MC_RESULT_REFUSED, what, filePath.c_str());
+    StopAfterFailure();
+}
+
+void ConvThread::Conversion::StopAfterFailure() {
+    if (converter.bStopOnFailure)
+        converter.Abort(0, 0);
+}
+
+void ConvThread::Conversion::NoteException() {
+    try {
+        throw;
+    } catch (const std::bad_alloc&) {
+        converter.results.Fail(MC_RESULT_INTERNAL, "There was no memory.");
+    } catch (const std::exception& error) {
+        char what[MC_TEXT_SIZE];
+        std::snprintf(what, sizeof what, "A decoder threw an exception: %s", error.what());
+        converter.results.Fail(MC_RESULT_SOURCE, what);
+    } catch (...) {
+        converter.results.Fail(MC_RESULT_SOURCE, "A decoder threw an exception.");
+    }
+    LogAt(kLogError, L"MovieConv::An exception came out of a decoder.\r\n");
 }
 
 bool ConvThread::Conversion::CreateFirstFile() {
@@ -65,8 +136,7 @@ bool ConvThread::Conversion::ClipFull() const {
 }
 
 void ConvThread::Conversion::CloseClip() {
-    MWCloseMediaFile(hFile, nullptr, nullptr);
-    hFile = nullptr;
+    CloseFile(nullptr, nullptr);
     dClipStart = dPosition;
 }
 
@@ -101,30 +171,46 @@ bool ConvThread::Conversion::NotifyProgress(uint32_t now, VideoImage* preview) {
 
     const auto value = static_cast<unsigned>(nProgress);
     Post(kMessageProgress, value);
-    return converter.pfnProgress(converter.pProgressContext, 0, value, CallbackInfo(&info)) != 0;
+    return CallBack(0, value, &info) != 0;
 }
 
 int ConvThread::Conversion::Finish(unsigned outcome, double doneLength) {
-    MWCloseMediaFile(hFile, converter.pfnProgress, converter.pProgressContext);
+    CloseFile(converter.pfnProgress, converter.pProgressContext);
 
     ProgressInfo info = MakeProgressInfo(kProgressComplete, MillisecondClock() - tStart);
     info.dDoneLength = doneLength;
     if (outcome == kOutcomeCompleted) {
         Post(kMessageProgress, kProgressComplete);
-        if (converter.pfnProgress)
-            converter.pfnProgress(converter.pProgressContext, 0, kProgressComplete, CallbackInfo(&info));
+        CallBack(0, kProgressComplete, &info);
     }
-    return NotifyFinished(outcome, outcome == kOutcomeFailed ? nullptr : &info);
+    return NotifyFinished(outcome, outcome == kOutcomeFailed ? nullptr : &info, true);
 }
 
-int ConvThread::Conversion::ReportFailure() {
-    return NotifyFinished(kOutcomeFailed, nullptr);
+int ConvThread::Conversion::ReportFailure(int category, const char* what, bool event) {
+    converter.results.Fail(category, what);
+    return NotifyFinished(kOutcomeFailed, nullptr, event);
 }
 
-int ConvThread::Conversion::NotifyFinished(unsigned outcome, ProgressInfo* info) {
-    const int posted = Post(kMessageFinished, outcome);
+int ConvThread::Conversion::ReportException() {
+    NoteException();
+    return NotifyFinished(kOutcomeFailed, nullptr, true);
+}
+
+int ConvThread::Conversion::NotifyFinished(unsigned outcome, ProgressInfo* info, bool event) {
+    converter.results.End(outcome, pVideoFormat != nullptr);
+    const int posted = event ? Post(kMessageFinished, outcome) : 1;
+    return converter.pfnProgress ? static_cast<int>(CallBack(1, outcome, info)) : posted;
+}
+
+unsigned ConvThread::Conversion::CallBack(unsigned kind, unsigned value, const ProgressInfo* info) {
     if (!converter.pfnProgress)
-        return posted;
-    return static_cast<int>(
-        converter.pfnProgress(converter.pProgressContext, 1, outcome, CallbackInfo(info)));
+        return 1;
+    try {
+        return converter.pfnProgress(converter.pProgressContext, kind, value,
+                                     reinterpret_cast<uintptr_t>(info));
+    } catch (...) {
+        converter.results.Fail(MC_RESULT_CALLBACK, "The progress callback threw an exception.");
+        LogAt(kLogError, L"MovieConv::An exception came out of the progress callback.\r\n");
+        return 0; // which cancels
+    }
 }

@@ -5,7 +5,6 @@
 #include "engine/SourceFormat.h"
 #include "log/dyLog.h"
 #include "media/FourCC.h"
-#include "media/MediaWriter.h"
 #include "thread/Clock.h"
 
 namespace {
@@ -49,24 +48,22 @@ int ConvThread::VideoLoop::Run() {
     if (!pVideoFormat || pVideoFormat->dDuration < kMinDuration)
         return ReportNoPictures();
     if (!CreateFirstFile())
-        return ReportFailure();
-    const double begin = BeginTime();
-    if (begin > 0.0)
-        converter.pVideoDecoder->Seek(begin, 1);
-    StartClock();
-    tLastNotified = tStart;
-
-    const unsigned outcome = Iterate();
-
+        return ReportFailure(MC_RESULT_CANNOT_OPEN, "");
+    const unsigned outcome = Guarded([this] {
+        const double begin = BeginTime();
+        if (begin > 0.0)
+            converter.pVideoDecoder->Seek(begin, 1);
+        StartClock();
+        tLastNotified = tStart;
+        return Iterate();
+    });
     return Finish(outcome, converter.dConvLength);
 }
 
 // Unlike every other failure this one comes without an event.
 int ConvThread::VideoLoop::ReportNoPictures() {
-    const int logged = LogAt(kLogError, L"MovieConv::Without video decoder.");
-    if (!converter.pfnProgress)
-        return logged;
-    return static_cast<int>(converter.pfnProgress(converter.pProgressContext, 1, kOutcomeFailed, 0));
+    LogAt(kLogError, L"MovieConv::Without video decoder.");
+    return ReportFailure(MC_RESULT_SOURCE, "There are no pictures to convert.", false);
 }
 
 unsigned ConvThread::VideoLoop::Iterate() {
@@ -101,7 +98,7 @@ void ConvThread::VideoLoop::WritePicture(const VideoImage& picture) {
     VideoImage copy = picture;
     copy.llTime2 = WrapSub(copy.llTime2, llClipBase2);
     copy.llTime = WrapSub(copy.llTime, llClipBase);
-    MWWriteVideoFrame(hFile, &copy);
+    Send(copy);
 }
 
 void ConvThread::VideoLoop::MoveTo(int64_t time) {

@@ -52,7 +52,8 @@ int Write(const void* file, std::vector<Record> recorder::Recording::*records, c
     recorder::Note(line);
     const std::lock_guard guard(g_mutex);
     (g_recording.*records).push_back(record);
-    return file != nullptr;
+    const size_t writes = g_recording.pictures.size() + g_recording.sounds.size();
+    return file != nullptr && writes <= g_behaviour.takenWrites;
 }
 
 } // namespace
@@ -108,5 +109,6 @@ int MWCloseMediaFile(void* file, ProgressCallback callback, void* context) {
         Call(&recorder::Behaviour::onClose);
     const char* const with[] = {"", " with context", " with callback", " with callback and context"};
     recorder::Note(Line("close #%d%s", Number(file), with[(callback ? 2 : 0) + (context ? 1 : 0)]));
-    return file != nullptr;
+    const std::lock_guard guard(g_mutex);
+    return file != nullptr && !g_behaviour.failingCloses;
 }

@@ -10,6 +10,7 @@
 #include "media/EncodeParam.h"
 #include "media/MediaRecords.h"
 
+#include <cstdint>
 #include <cstdio>
 #include <cstring>
 #include <functional>
@@ -37,6 +38,8 @@ struct Recording {
 
 struct Behaviour {
     std::set<int> failingCreates = {};       ///< Their numbers, from 1.
+    size_t takenWrites = SIZE_MAX;           ///< So many are taken, all later ones are refused.
+    bool failingCloses = false;              ///< No file is complete.
     const FileFormatInfo* formats = nullptr; ///< What MWGetFileFormatInfos gives out; stays the caller's.
     std::function<void()> onWrite = {};      ///< Called in every write before it is noted.
     std::function<void()> onClose = {};      ///< Called in every final close, one with a callback.

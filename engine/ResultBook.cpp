@@ -1,0 +1,71 @@
+#include "engine/ResultBook.h"
+
+#include "engine/ProgressInfo.h"
+
+#include <algorithm>
+#include <cstring>
+
+namespace {
+
+/// Copies what fits and ends it between two characters.
+template <size_t N>
+void CopyText(char (&to)[N], const char* from) {
+    size_t length = std::min(std::strlen(from), N - 1);
+    while (from[length] != '\0' && length > 0 && (from[length] & 0xC0) == 0x80)
+        --length;
+    std::memcpy(to, from, length);
+    to[length] = '\0';
+}
+
+} // namespace
+
+void ResultBook::Begin() {
+    const CSingleLock guard(&lock);
+    result = {};
+    result.nSize = sizeof result;
+    result.nCategory = MC_RESULT_RUNNING;
+    result.nOutcome = -1;
+}
+
+void ResultBook::Fail(int category, const char* what, const char* path, int systemError) {
+    const CSingleLock guard(&lock);
+    FailLocked(category, what, path, systemError);
+}
+
+void ResultBook::FailLocked(int category, const char* what, const char* path, int systemError) {
+    if (result.nCategory != MC_RESULT_RUNNING)
+        return;
+    result.nCategory = category;
+    result.nSystemError = systemError;
+    CopyText(result.szWhat, what);
+    CopyText(result.szPath, path);
+}
+
+void ResultBook::End(unsigned outcome, bool pictures) {
+    const CSingleLock guard(&lock);
+    result.nOutcome = static_cast<int32_t>(outcome);
+    if (outcome == kOutcomeStopped)
+        FailLocked(MC_RESULT_STOPPED, "The conversion was stopped.", "", 0);
+    else if (outcome == kOutcomeCancelled)
+        FailLocked(MC_RESULT_CANCELLED, "The conversion was cancelled by its callback.", "", 0);
+    else if (outcome == kOutcomeFailed)
+        FailLocked(MC_RESULT_INTERNAL, "The conversion could not be started.", "", 0);
+    else if (pictures && result.llPicturesSent == 0)
+        FailLocked(MC_RESULT_SOURCE, "The source was to have pictures, but gave none.", "", 0);
+    else if (result.llPicturesSent == 0 && result.llSamplesSent == 0)
+        FailLocked(MC_RESULT_SOURCE, "The source gave nothing.", "", 0);
+    else
+        FailLocked(MC_RESULT_DONE, "", "", 0);
+    result.bDone = result.nCategory == MC_RESULT_DONE ? 1 : 0;
+}
+
+bool ResultBook::Copy(MCResult* to) const {
+    constexpr uint32_t kLeast = sizeof(MCResult); // of the first version that had it
+    if (!to || to->nSize < kLeast)
+        return false;
+    const uint32_t size = std::min<uint32_t>(to->nSize, sizeof result);
+    const CSingleLock guard(&lock);
+    std::memcpy(to, &result, size);
+    to->nSize = size;
+    return true;
+}

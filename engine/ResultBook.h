@@ -1,0 +1,45 @@
+// What becomes of a converter's conversion: written by the host's thread and the worker, read from anywhere.
+#ifndef MOVIECONV_ENGINE_RESULTBOOK_H
+#define MOVIECONV_ENGINE_RESULTBOOK_H
+
+#include "engine/Result.h"
+#include "thread/SingleLock.h"
+
+#include <pthread.h>
+
+class ResultBook {
+public:
+    ResultBook() = default;
+    ~ResultBook() { pthread_mutex_destroy(&lock); }
+    ResultBook(const ResultBook&) = delete;
+    ResultBook& operator=(const ResultBook&) = delete;
+
+    /// A conversion begins.
+    void Begin();
+
+    /// Notes what is wrong, unless something was before. Both texts are UTF-8, and cut where they do not
+    /// fit. Needs no memory.
+    void Fail(int category, const char* what, const char* path = "", int systemError = 0);
+
+    /// Notes how the conversion ended. Without a failure that decides what it was; one that completed must
+    /// have sent pictures where `pictures` are wanted.
+    void End(unsigned outcome, bool pictures);
+
+    /// Changes figures.
+    template <class Change>
+    void Update(Change change) {
+        const CSingleLock guard(&lock);
+        change(result);
+    }
+
+    /// Fills as much of the record as there is. False for one that is too small.
+    bool Copy(MCResult* to) const;
+
+private:
+    void FailLocked(int category, const char* what, const char* path, int systemError);
+
+    mutable pthread_mutex_t lock = PTHREAD_MUTEX_INITIALIZER;
+    MCResult result{sizeof(MCResult), 0, MC_RESULT_NONE, -1, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, {}, {}};
+};
+
+#endif
