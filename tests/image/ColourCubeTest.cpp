@@ -85,6 +85,6 @@ TEST_P(ColourCubeTest, ColoursAreExact) {
     ExpectCubes(std::getenv("MOVIECONV_ENDURANCE") == nullptr ? kSomeColours : 1);
 }
 
-INSTANTIATE_TEST_SUITE_P(Levels, ColourCubeTest, testing::ValuesIn(kKernelLevels), LevelName);
+INSTANTIATE_TEST_SUITE_P(Levels, ColourCubeTest, testing::ValuesIn(AllKernels()), KernelsName);
 
 } // namespace

@@ -96,6 +96,6 @@ TEST_P(RowKernelsTest, EveryWidthOfAFewVectorsAndSomeWiderRows) {
         CompareAll(width);
 }
 
-INSTANTIATE_TEST_SUITE_P(Levels, RowKernelsTest, testing::ValuesIn(kKernelLevels), LevelName);
+INSTANTIATE_TEST_SUITE_P(Levels, RowKernelsTest, testing::ValuesIn(AllKernels()), KernelsName);
 
 } // namespace

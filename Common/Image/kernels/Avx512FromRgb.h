@@ -1,7 +1,7 @@
 // RGB to 4:2:0 and to packed 4:2:2 with AVX-512.
 //
-// A lane of 32 bits holds a pixel as the bytes B, R, G, R. A sum starts with its offset of 16 or 128, so that
-// the component comes out as byte 2 of its lane.
+// A lane of 32 bits holds a pixel as the bytes B, R, G, R. Its Y and its centred Cb and Cr come out as byte 2
+// of a lane.
 #ifndef MOVIECONV_COMMON_IMAGE_KERNELS_AVX512FROMRGB_H
 #define MOVIECONV_COMMON_IMAGE_KERNELS_AVX512FROMRGB_H
 
@@ -10,7 +10,7 @@
 namespace image {
 namespace {
 
-/// 16 pixels' components, each in byte 2 of its lane.
+/// 16 pixels' components, each in byte 2 of its lane. What is above that byte is not to be looked at.
 struct Components {
     __m512i y, cb, cr;
 };
@@ -21,24 +21,24 @@ public:
     Components operator()(__m512i pixels) const {
         const __m512i luma = _mm512_maddubs_epi16(pixels, yInner_);
         const __m512i differences = _mm512_maddubs_epi16(pixels, BytePairs(1, -1));
-        return {_mm512_dpwssd_epi32(yStart_, luma, yOuter_),
-                _mm512_dpwssd_epi32(chromaStart_, differences, cb_),
+        return {_mm512_dpwssd_epi32(yStart_, luma, yOuter_), _mm512_dpwssd_epi32(rounding_, differences, cb_),
                 _mm512_dpwssd_epi32(CrStart(pixels), differences, cr_)};
     }
 
 private:
     __m512i CrStart(__m512i pixels) const {
         if constexpr (Form::kCrSum == 0)
-            return chromaStart_;
-        else
-            return _mm512_dpbusd_epi32(chromaStart_, pixels, _mm512_set1_epi32(Form::kCrSum << 8));
+            return rounding_;
+        // 4 R, and of G what is less than the step of a sum
+        static_assert(Form::kCrSum == 0 || (Form::kCrSum == 4 && Form::kScale == 4 && Form::kRounding == 0));
+        return _mm512_srli_epi32(pixels, 22);
     }
 
     __m512i yStart_ = _mm512_set1_epi32((16 << 16) + Form::kRounding);
     __m512i yInner_ = Words((Form::kYInnerBlue & 0xFF) | Form::kYBesideBlue * 256,
                             (Form::kYInnerGreen & 0xFF) | Form::kYBesideGreen * 256);
     __m512i yOuter_ = Words(Form::kYOuterBlue, Form::kYOuterGreen);
-    __m512i chromaStart_ = _mm512_set1_epi32((128 << 16) + Form::kRounding);
+    __m512i rounding_ = _mm512_set1_epi32(Form::kRounding);
     __m512i cb_ = Words(Form::kCbBlueWeight, Form::kCbGreenWeight);
     __m512i cr_ = Words(Form::kCrBlueWeight, Form::kCrGreenWeight);
 };
@@ -130,8 +130,12 @@ public:
     __m512i operator()(__m512i low0, __m512i low1, __m512i high0, __m512i high1) const {
         constexpr uint64_t kFromSecond = kPlaces.FromSecond();
         const __m512i low = PermutePair(low0, low1, places_, kFromSecond);
+#ifdef MOVIECONV_PERMUTE_PAIRS
+        return _mm512_mask_blend_epi8(kHighWords, low, PermutePair(high0, high1, places_, kFromSecond));
+#else
         const __m512i first = _mm512_mask_permutexvar_epi8(low, kHighWords & ~kFromSecond, places_, high0);
         return _mm512_mask_permutexvar_epi8(first, kHighWords & kFromSecond, places_, high1);
+#endif
     }
 
 private:
@@ -167,9 +171,9 @@ public:
     }
 
 private:
-    /// 64 times the sum of a lane's bytes: their truncated average is byte 1.
+    /// 64 times the sum of a lane's centred bytes and the offset: the stored average is byte 1.
     __m512i SumOfFour(__m512i bytes) const {
-        return _mm512_dpbusd_epi32(_mm512_setzero_si512(), bytes, _mm512_set1_epi8(64));
+        return _mm512_dpbusd_epi32(_mm512_set1_epi32(128 << 8), _mm512_set1_epi8(64), bytes);
     }
 
     static constexpr Table kChroma = MakeTable([](int i) { return (i % 32 < 16 ? 0 : 64) + i % 16 * 4 + 1; });
@@ -232,8 +236,11 @@ void PackedFromBgr24(Rows packed, Rows rgb, Size size) {
             const __m512i lumaPlaces = RepeatLastPixel(columns, kLuma.Load(), 0x04040000);
             const __m512i luma = PermutePair(a.y, b.y, lumaPlaces, kLuma.FromSecond());
             const GatherPairs gather(columns);
-            const __m512i sums = _mm512_maddubs_epi16(gather(a.cb, b.cb, a.cr, b.cr), _mm512_set1_epi8(1));
-            const __m512i chroma = kOrder == kYuy2 ? _mm512_slli_epi16(sums, 7) : _mm512_srli_epi16(sums, 1);
+            // 128 times the sum of two and the offset: the stored average is byte 1
+            const __m512i averages =
+                _mm512_add_epi16(_mm512_maddubs_epi16(_mm512_set1_epi8(-128), gather(a.cb, b.cb, a.cr, b.cr)),
+                                 _mm512_set1_epi16(-0x8000));
+            const __m512i chroma = kOrder == kYuy2 ? averages : _mm512_srli_epi16(averages, 8);
             Store<Memory>(columns, target + 2 * x, 4 * ((columns.count + 1) / 2),
                           _mm512_mask_blend_epi8(kChromaBytes, luma, chroma));
         });

@@ -135,10 +135,15 @@ struct alignas(64) Table {
     }
 };
 
-/// The bytes of two registers at the given places, by a permutation of each: the one of two registers at once
-/// takes three operations on some processors.
+/// The bytes of two registers at the given places; `fromSecond` marks those with places in the second. AMD's
+/// processors permute two registers as fast as one, Intel's take three operations for it.
 inline __m512i PermutePair(__m512i first, __m512i second, __m512i places, uint64_t fromSecond) {
+#ifdef MOVIECONV_PERMUTE_PAIRS
+    static_cast<void>(fromSecond);
+    return _mm512_permutex2var_epi8(first, places, second);
+#else
     return _mm512_mask_permutexvar_epi8(_mm512_permutexvar_epi8(places, first), fromSecond, places, second);
+#endif
 }
 
 /// Byte i of the table is what `entry(i)` says.

@@ -91,21 +91,21 @@ Rgb ToRgb(__m512i y, const ChromaTerms<Form>& terms) {
 /// One of the three parts of 64 pixels of three bytes.
 template <int kThird>
 struct Bgr24Third {
-    static constexpr Table kPlaces = MakeTable([](int i) { return PlaceOf((64 * kThird + i) / 3); });
-    static constexpr uint64_t BytesOf(int component) {
-        uint64_t mask = 0;
-        for (int i = 0; i < 64; ++i)
-            mask |= uint64_t{(64 * kThird + i) % 3 == component} << i;
-        return mask;
-    }
-
     __m512i operator()(const Rgb& rgb) const {
-        const __m512i blue = _mm512_permutexvar_epi8(places_, rgb.blue);
-        const __m512i blueGreen = _mm512_mask_permutexvar_epi8(blue, BytesOf(1), places_, rgb.green);
-        return _mm512_mask_permutexvar_epi8(blueGreen, BytesOf(2), places_, rgb.red);
+        const __m512i blueGreen = PermutePair(rgb.blue, rgb.green, places_, kPlaces.FromSecond());
+        return _mm512_mask_permutexvar_epi8(blueGreen, kReds, places_, rgb.red);
     }
 
 private:
+    static constexpr int Component(int i) { return (64 * kThird + i) % 3; }
+    static constexpr Table kPlaces =
+        MakeTable([](int i) { return PlaceOf((64 * kThird + i) / 3) + (Component(i) == 1 ? 64 : 0); });
+    static constexpr uint64_t kReds = [] {
+        uint64_t mask = 0;
+        for (int i = 0; i < 64; ++i)
+            mask |= uint64_t{Component(i) == 2} << i;
+        return mask;
+    }();
     __m512i places_ = kPlaces.Load();
 };
 

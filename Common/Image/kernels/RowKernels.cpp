@@ -20,6 +20,10 @@ bool HasAvx512() {
            __builtin_cpu_supports("avx512vl") && __builtin_cpu_supports("avx512vbmi") &&
            __builtin_cpu_supports("avx512vnni");
 }
+
+const RowKernels* Avx512Kernels() {
+    return __builtin_cpu_is("amd") ? &kAvx512PairsKernels : &kAvx512Kernels;
+}
 #endif
 
 /// The kernels that the user asks for; null when nothing is asked, or what this machine has not.
@@ -52,7 +56,7 @@ const RowKernels* RowKernelsFor(KernelLevel level) {
     case KernelLevel::kAvx2:
         return __builtin_cpu_supports("avx2") ? &kAvx2Kernels : nullptr;
     case KernelLevel::kAvx512:
-        return HasAvx512() ? &kAvx512Kernels : nullptr;
+        return HasAvx512() ? Avx512Kernels() : nullptr;
 #endif
 #ifdef MOVIECONV_NEON_KERNELS
     case KernelLevel::kNeon:

@@ -106,6 +106,7 @@ extern const RowKernels kPlainKernels;
 extern const RowKernels kSse41Kernels;
 extern const RowKernels kAvx2Kernels;
 extern const RowKernels kAvx512Kernels;
+extern const RowKernels kAvx512PairsKernels;
 extern const RowKernels kNeonKernels;
 
 } // namespace image
