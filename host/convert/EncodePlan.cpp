@@ -1,7 +1,7 @@
 #include "host/convert/EncodePlan.h"
 
+#include "host/convert/Failure.h"
 #include "host/convert/Formats.h"
-#include "host/terminal/ExitCode.h"
 #include "media/FourCC.h"
 #include "writer/WriterStatus.h"
 
@@ -14,24 +14,13 @@ namespace {
 constexpr double kHighestFrameRate = 200; // of the output: from a source of more the engine makes 30
 constexpr uint32_t kSteadyRateFormat = FourCC("AVI "); // leaves out what comes faster than its one rate
 
-uint32_t CodecCode(const std::string& text, const char* option) {
-    const auto code = ParseCode(text);
-    if (!code) {
-        throw Failure(
-            ExitCode::kUsage,
-            fmt::format("{} takes a code of up to four characters; see \"movieconv --list-formats\"",
-                        option));
-    }
-    return *code;
-}
-
-uint32_t FindCarried(const std::string& asked, const FileFormatInfo& format, bool forSound) {
-    const char* option = forSound ? "--audio-codec" : "--video-codec";
-    const uint32_t code = MWFindCodec(format.fccFormat, CodecCode(asked, option), forSound ? 1 : 0);
+uint32_t FindCarried(uint32_t asked, const FileFormatInfo& format, bool forSound) {
+    const uint32_t code = MWFindCodec(format.fccFormat, asked, forSound ? 1 : 0);
     if (code == 0) {
-        throw Failure(ExitCode::kUsage,
-                      fmt::format("{} cannot carry {} as \"{}\"; see \"movieconv --list-formats\"",
-                                  format.szName, forSound ? "sound" : "pictures", asked));
+        throw Failure(Category::kRequest,
+                      fmt::format("{} cannot carry {} as \"{}\"", format.szName,
+                                  forSound ? "sound" : "pictures", CodeName(asked)),
+                      Reason::kCodec);
     }
     return code;
 }
@@ -45,73 +34,76 @@ uint32_t UsualCodec(uint32_t usual, const uint32_t (&carried)[N]) {
 
 } // namespace
 
-const FileFormatInfo& ChooseFormat(const Options& options) {
+const FileFormatInfo& ChooseFormat(const Request& request) {
     const FileFormatInfo* format =
-        options.format ? FindFormat(*options.format) : FindFormatOfFile(options.output);
-    if (format == nullptr) {
-        throw Failure(ExitCode::kUsage,
-                      options.format
-                          ? fmt::format("there is no file format \"{}\"; see \"movieconv --list-formats\"",
-                                        *options.format)
-                          : fmt::format("the extension of \"{}\" tells no file format; use --format, see "
-                                        "\"movieconv --list-formats\"",
-                                        options.output));
+        request.format ? FindFormat(CodeName(*request.format)) : FindFormatOfFile(request.output);
+    if (format == nullptr && request.format) {
+        throw Failure(Category::kRequest,
+                      fmt::format("there is no file format \"{}\"", CodeName(*request.format)),
+                      Reason::kCodec);
     }
-    if (options.videoCodec)
-        FindCarried(*options.videoCodec, *format, false);
-    if (options.audioCodec)
-        FindCarried(*options.audioCodec, *format, true);
+    if (format == nullptr) {
+        throw Failure(Category::kRequest,
+                      fmt::format("the extension of \"{}\" tells no file format", request.output),
+                      Reason::kNoFormat);
+    }
+    if (request.videoCodec)
+        FindCarried(*request.videoCodec, *format, false);
+    if (request.audioCodec)
+        FindCarried(*request.audioCodec, *format, true);
     return *format;
 }
 
-EncodeParam PlanEncoding(const EncodeParam& defaults, const FileFormatInfo& format, const Options& options,
+EncodeParam PlanEncoding(const EncodeParam& defaults, const FileFormatInfo& format, const Request& request,
                          const SourceInfo& source) {
     EncodeParam param = defaults;
     param.fccFileFormat = format.fccFormat;
-    param.fccVideo = options.videoCodec ? FindCarried(*options.videoCodec, format, false)
+    param.fccVideo = request.videoCodec ? FindCarried(*request.videoCodec, format, false)
                                         : UsualCodec(param.fccVideo, format.fccVideoCodecs);
-    param.fccAudio = options.audioCodec ? FindCarried(*options.audioCodec, format, true)
+    param.fccAudio = request.audioCodec ? FindCarried(*request.audioCodec, format, true)
                                         : UsualCodec(param.fccAudio, format.fccAudioCodecs);
-    if (options.size) {
-        param.nWidth = options.size->width;
-        param.nHeight = options.size->height;
+    if (request.size) {
+        param.nWidth = request.size->width;
+        param.nHeight = request.size->height;
     }
-    param.bResize = options.fit == Fit::kStretch ? 1 : 0;
-    if (options.frameRate) // no reference to the record's double, which lies on a 4-byte boundary
-        param.dFrameRate = *options.frameRate;
+    param.bResize = request.fit == Fit::kStretch ? 1 : 0;
+    if (request.frameRate) // no reference to the record's double, which lies on a 4-byte boundary
+        param.dFrameRate = *request.frameRate;
     else if (source.pictures && format.fccFormat == kSteadyRateFormat &&
              source.pictures->frameRate <= kHighestFrameRate)
         param.dFrameRate = std::min(source.pictures->peakRate, kHighestFrameRate);
-    param.nVideoBitrate = options.videoRate.value_or(param.nVideoBitrate);
-    param.nVideoMaxBitrate = options.videoMaxRate.value_or(0);
-    param.nVideoRateMode = options.videoMaxRate ? 1 : 0;
-    param.nChannels = options.channels.value_or(param.nChannels);
-    param.nSampleRate = options.sampleRate.value_or(param.nSampleRate);
-    param.nAudioBitrate = options.audioRate.value_or(param.nAudioBitrate);
-    param.nAudioMaxBitrate = options.audioMaxRate.value_or(0);
-    param.nAudioRateMode = options.audioMaxRate ? 1 : 0;
+    param.nVideoBitrate = request.videoRate.value_or(param.nVideoBitrate);
+    param.nVideoMaxBitrate = request.videoMaxRate.value_or(0);
+    param.nVideoRateMode = request.videoMaxRate ? 1 : 0;
+    param.nChannels = request.channels.value_or(param.nChannels);
+    param.nSampleRate = request.sampleRate.value_or(param.nSampleRate);
+    param.nAudioBitrate = request.audioRate.value_or(param.nAudioBitrate);
+    param.nAudioMaxBitrate = request.audioMaxRate.value_or(0);
+    param.nAudioRateMode = request.audioMaxRate ? 1 : 0;
     if (source.sound)
         param.nBitsPerSample = source.sound->bitsPerSample;
     param.bNoVideo = source.pictures && format.bHasVideo != 0 ? 0 : 1;
     param.bNoAudio = source.sound && format.bHasAudio != 0 ? 0 : 1;
     if (param.bNoVideo != 0 && param.bNoAudio != 0) {
-        throw Failure(ExitCode::kUsage,
+        throw Failure(Category::kRequest,
                       fmt::format("{} carries nothing that \"{}\" holds; choose another format",
                                   format.szName, source.path));
     }
     return param;
 }
 
-double LengthToConvert(const Options& options, const SourceInfo& source) {
-    const double rest = source.duration - options.begin;
+double LengthToConvert(const Request& request, const SourceInfo& source) {
+    const double rest = source.duration - request.begin;
     if (rest <= 0 && source.certainty == Certainty::kKnown) {
-        throw Failure(ExitCode::kUsage,
-                      fmt::format("--begin is not before the end of \"{}\", which is {:.3f} s long",
-                                  source.path, source.duration));
+        throw Failure(
+            Category::kRequest,
+            fmt::format("the begin, {:.3f} s, is not before the end of \"{}\", which is {:.3f} s long",
+                        request.begin, source.path, source.duration),
+            Reason::kBeginTooLate);
     }
-    if (!options.length)
+    if (!request.length)
         return std::max(rest, 0.0);
-    return source.certainty == Certainty::kKnown ? std::min(*options.length, rest) : *options.length;
+    return source.certainty == Certainty::kKnown ? std::min(*request.length, rest) : *request.length;
 }
 
 } // namespace movieconv

@@ -1,7 +1,7 @@
 #include "host/convert/FileLedger.h"
 
-#include "host/convert/OutputCheck.h"
-#include "host/terminal/Units.h"
+#include "host/convert/Amounts.h"
+#include "host/convert/Room.h"
 #include "text/Path.h"
 
 #include <algorithm>
@@ -14,20 +14,23 @@ namespace {
 
 constexpr double kLengthTolerance = 0.1; // seconds: a picture or a codec's frame, at any usual rate
 
-/// The exit code for what went wrong with a file.
-ExitCode CodeOf(const WriterStatus& failure) {
-    switch (failure.nError) {
+Category CategoryOf(int error) {
+    switch (error) {
     case kWriterErrorArgument:
     case kWriterErrorFormat:
     case kWriterErrorCodec:
-        return ExitCode::kUsage;
+        return Category::kRequest;
     case kWriterErrorNoSpace:
-        return ExitCode::kNoSpace;
+        return Category::kNoSpace;
     case kWriterErrorInternal:
-        return ExitCode::kInternal;
+        return Category::kInternal;
     default:
-        return ExitCode::kCannotWrite;
+        return Category::kOutput;
     }
+}
+
+Reason ReasonOf(int error) {
+    return error == kWriterErrorCodec || error == kWriterErrorFormat ? Reason::kCodec : Reason::kOther;
 }
 
 /// What went wrong, where, and what remains.
@@ -44,8 +47,6 @@ std::string TextOf(const WriterStatus& failure) {
         const int64_t free = FreeBytes(text::FolderOf(failure.szPath));
         text += fmt::format("; {} were written, {} are free: make room or choose another disk",
                             FormatBytes(failure.llBytesWritten), FormatBytes(free > 0 ? free : 0));
-    } else if (failure.nError == kWriterErrorCodec || failure.nError == kWriterErrorFormat) {
-        text += "; see \"movieconv --list-formats\"";
     }
     if (failure.szTemporaryPath[0] != '\0')
         text += fmt::format("; what was written so far is in \"{}\"", failure.szTemporaryPath);
@@ -74,7 +75,7 @@ bool FileLedger::Enter(const WriterWatch::News& news) {
     case kWriterEventOpened:
         ++opened_;
         finishing_.reset();
-        reporter_.FileOpened(opened_, news.status.szPath);
+        observer_.Opened({opened_, news.status.szPath, news.status.szTemporaryPath});
         break;
     case kWriterEventFinishing:
         finishing_ = news.status.dFinished;
@@ -87,7 +88,7 @@ bool FileLedger::Enter(const WriterWatch::News& news) {
         break;
     }
     if (news.status.nError != kWriterErrorNone && wasWell && !failure_)
-        failure_.emplace(CodeOf(news.status), TextOf(news.status));
+        failure_.emplace(CategoryOf(news.status.nError), TextOf(news.status), ReasonOf(news.status.nError));
     return !(wasWell && failure_);
 }
 
@@ -96,9 +97,9 @@ void FileLedger::EnterClosed(const WriterStatus& file) {
         return;
     ++complete_;
     bytes_ += file.llBytesWritten;
-    reporter_.FileClosed({opened_, file.szPath, file.dVideoWritten, file.dAudioWritten, file.llBytesWritten});
+    observer_.Closed({opened_, file.szPath, file.dVideoWritten, file.dAudioWritten, file.llBytesWritten});
     if (const std::string missing = MissingFrom(file); !missing.empty() && !failure_)
-        failure_.emplace(ExitCode::kInternal, missing);
+        failure_.emplace(Category::kInternal, missing);
 }
 
 } // namespace movieconv

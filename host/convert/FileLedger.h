@@ -2,21 +2,20 @@
 #ifndef MOVIECONV_HOST_CONVERT_FILELEDGER_H
 #define MOVIECONV_HOST_CONVERT_FILELEDGER_H
 
+#include "host/convert/Failure.h"
+#include "host/convert/Observer.h"
 #include "host/convert/WriterWatch.h"
-#include "host/terminal/ExitCode.h"
-#include "host/terminal/Reporter.h"
 
 #include <optional>
 #include <string>
 
 namespace movieconv {
 
-/// The main thread's.
 class FileLedger {
 public:
-    explicit FileLedger(Reporter& reporter) : reporter_(reporter) {}
+    explicit FileLedger(Observer& observer) : observer_(observer) {}
 
-    /// Enters what the writer told and reports it. False when a file has failed for the first time.
+    /// Enters what the writer told and tells it. False when a file has failed for the first time.
     bool Enter(const WriterWatch::News& news);
 
     int Opened() const { return opened_; }
@@ -32,7 +31,7 @@ public:
 private:
     void EnterClosed(const WriterStatus& file);
 
-    Reporter& reporter_;
+    Observer& observer_;
     int opened_ = 0;
     int complete_ = 0;
     int64_t bytes_ = 0;

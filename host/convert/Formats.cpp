@@ -5,8 +5,6 @@
 
 #include <algorithm>
 #include <cctype>
-#include <fmt/format.h>
-#include <iterator>
 
 namespace movieconv {
 namespace {
@@ -41,24 +39,6 @@ const FileFormatInfo* FindIf(Matches matches) {
     return nullptr;
 }
 
-template <std::size_t N>
-std::string CodecList(const uint32_t (&codes)[N]) {
-    std::string list;
-    for (const uint32_t code : codes) {
-        if (code == 0)
-            break;
-        list += (list.empty() ? "" : ", ") + CodeName(code);
-    }
-    return list.empty() ? "none" : list;
-}
-
-/// "mp4,m4v" as ".mp4, .m4v".
-std::string ExtensionList(std::string list) {
-    for (std::size_t comma = list.find(','); comma != std::string::npos; comma = list.find(',', comma + 1))
-        list.replace(comma, 1, ", .");
-    return "." + list;
-}
-
 } // namespace
 
 const FileFormatInfo* FindFormat(std::string_view name) {
@@ -90,22 +70,6 @@ std::string CodeName(uint32_t code) {
     for (int shift = 0; shift < 32; shift += 8)
         name += static_cast<char>(code >> shift & 0xFF);
     return name.substr(0, name.find_last_not_of(' ') + 1);
-}
-
-std::string ListFormats() {
-    std::string text;
-    FindIf([&](const FileFormatInfo& format) {
-        fmt::format_to(std::back_inserter(text), "{:<5} {} ({})\n", CodeName(format.fccFormat), format.szName,
-                       ExtensionList(format.szExtensions));
-        if (format.bHasVideo != 0)
-            fmt::format_to(std::back_inserter(text), "      pictures: {}\n",
-                           CodecList(format.fccVideoCodecs));
-        if (format.bHasAudio != 0)
-            fmt::format_to(std::back_inserter(text), "      sound:    {}\n",
-                           CodecList(format.fccAudioCodecs));
-        return false;
-    });
-    return text;
 }
 
 } // namespace movieconv

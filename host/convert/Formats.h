@@ -1,4 +1,4 @@
-// The media writer's file formats, as the command line names them.
+// The media writer's file formats and how people name them.
 #ifndef MOVIECONV_HOST_CONVERT_FORMATS_H
 #define MOVIECONV_HOST_CONVERT_FORMATS_H
 
@@ -22,9 +22,6 @@ std::optional<uint32_t> ParseCode(std::string_view text);
 
 /// The characters of a code, without the spaces at its end.
 std::string CodeName(uint32_t code);
-
-/// The table for --list-formats.
-std::string ListFormats();
 
 } // namespace movieconv
 

@@ -2,9 +2,8 @@
 #ifndef MOVIECONV_HOST_CONVERT_OUTPUTCHECK_H
 #define MOVIECONV_HOST_CONVERT_OUTPUTCHECK_H
 
-#include "host/terminal/Options.h"
+#include "host/convert/Request.h"
 
-#include <cstdint>
 #include <string>
 
 namespace movieconv {
@@ -12,14 +11,18 @@ namespace movieconv {
 /// Throws Failure when the output, or a clip of it, would replace the input or an existing file without
 /// leave, cannot be written where it is to go, or has a name that is too long for the file system or of which
 /// no clip names can be made.
-void CheckOutput(const Options& options);
+void CheckOutput(const Request& request);
 
-/// Throws Failure when the log or the preview would be written over the source, the output, a clip of it or
-/// its temporary file, or over each other, or the preview over what is no preview.
-void CheckSideFiles(const Options& options);
+/// Throws Failure when the file system of its folder cannot take the name. `suffix` is what it gets behind it
+/// for a while, if that is not shortened there.
+void CheckName(const std::string& path, const std::string& suffix = {});
 
-/// Bytes that an ordinary user can still write to the file system of `folder`; -1 when it cannot be told.
-int64_t FreeBytes(const std::string& folder);
+/// Whether both names stand for one file that exists.
+bool AreSame(const std::string& path, const std::string& other);
+
+/// Whether a file of that name is or becomes the output, a clip of it, or what they are called until they are
+/// complete.
+bool IsOutput(const std::string& path, const Request& request);
 
 } // namespace movieconv
 

@@ -1,7 +1,6 @@
 #include "host/convert/WriterWatch.h"
 
-#include "host/convert/HostEvents.h"
-#include "host/convert/OutputCheck.h"
+#include "host/convert/Room.h"
 #include "text/Path.h"
 
 #include <cerrno>
@@ -24,7 +23,7 @@ bool LatestFile(uint32_t set, WriterStatus& status) {
 
 } // namespace
 
-WriterWatch::WriterWatch(const Options& options, const SourceInfo& source) {
+WriterWatch::WriterWatch(const Request& request, const SourceInfo& source, Bell& bell) : bell_(bell) {
     WriterOptions writer{};
     if (source.pictures) {
         writer.nSampleAspectNum = source.pictures->pixelAspect.num;
@@ -33,10 +32,12 @@ WriterWatch::WriterWatch(const Options& options, const SourceInfo& source) {
         writer.nColorTransfer = source.pictures->colorTransfer;
         writer.nColorMatrix = source.pictures->colorMatrix;
     }
-    writer.bKeepExisting = options.overwrite ? 0 : 1;
-    writer.bRemovePartial = options.keepPartial ? 0 : 1;
+    writer.bKeepExisting = request.overwrite ? 0 : 1;
+    writer.bRemovePartial = request.keepPartial ? 0 : 1;
+    writer.nEncoderThreads = request.encoderThreads;
+    writer.bBitExact = request.bitExact ? 1 : 0;
     writer.pfnListener = OnEvent;
-    writer.pfnFullDisk = options.onFull == OnFull::kWait ? OnFullDisk : nullptr;
+    writer.pfnFullDisk = request.onFull == OnFull::kWait ? OnFullDisk : nullptr;
     writer.pContext = this;
     set_ = MWRegisterOptions(&writer);
     if (set_ == 0)
@@ -62,6 +63,14 @@ void WriterWatch::GiveUp() {
     {
         const std::lock_guard lock(mutex_);
         givenUp_ = true;
+    }
+    changed_.notify_all();
+}
+
+void WriterWatch::Retry() {
+    {
+        const std::lock_guard lock(mutex_);
+        retry_ = true;
     }
     changed_.notify_all();
 }
@@ -97,7 +106,7 @@ void WriterWatch::OnEvent(void* context, int event, const WriterStatus* status) 
     }
     if (event == kWriterEventClosed)
         watch->closedBytes_ += status->llBytesWritten;
-    PostHostEvent(EventKind::kWriterNews);
+    watch->bell_.Ring();
 }
 
 int WriterWatch::OnFullDisk(void* context, const WriterStatus* status) {
@@ -112,14 +121,17 @@ int WriterWatch::OnFullDisk(void* context, const WriterStatus* status) {
 int WriterWatch::WaitForRoom(const WriterStatus& status) {
     const std::string folder = text::FolderOf(status.szPath);
     waiting_ = true;
-    PostHostEvent(EventKind::kWriterNews);
+    bell_.Ring();
     bool givenUp = false;
+    bool retry = false;
     do {
         std::unique_lock lock(mutex_);
-        givenUp = changed_.wait_for(lock, kRetryInterval, [&] { return givenUp_; });
-    } while (!givenUp && FreeBytes(folder) < kEnoughRoom);
+        changed_.wait_for(lock, kRetryInterval, [&] { return givenUp_ || retry_; });
+        givenUp = givenUp_;
+        retry = std::exchange(retry_, false);
+    } while (!givenUp && !retry && FreeBytes(folder) < kEnoughRoom);
     waiting_ = false;
-    PostHostEvent(EventKind::kWriterNews);
+    bell_.Ring();
     return givenUp ? 0 : 1;
 }
 

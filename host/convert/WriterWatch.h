@@ -1,9 +1,10 @@
-// What the media writer tells about its files, brought from its threads to the main thread.
+// What the media writer tells about its files, brought from its threads to the conversion's.
 #ifndef MOVIECONV_HOST_CONVERT_WRITERWATCH_H
 #define MOVIECONV_HOST_CONVERT_WRITERWATCH_H
 
+#include "host/convert/Bell.h"
+#include "host/convert/Request.h"
 #include "host/source/Source.h"
-#include "host/terminal/Options.h"
 #include "writer/WriterStatus.h"
 
 #include <atomic>
@@ -23,7 +24,8 @@ public:
         WriterStatus status;
     };
 
-    WriterWatch(const Options& options, const SourceInfo& source);
+    /// `bell` is rung whenever there is news.
+    WriterWatch(const Request& request, const SourceInfo& source, Bell& bell);
     ~WriterWatch();
     WriterWatch(const WriterWatch&) = delete;
     WriterWatch& operator=(const WriterWatch&) = delete;
@@ -40,8 +42,11 @@ public:
     /// Whether the file that is being written has lost its place, by its own removal or the folder's.
     bool FileVanished() const;
 
-    /// Ends that waiting: the file fails.
+    /// Ends the waiting for room: the file fails.
     void GiveUp();
+
+    /// Ends the waiting for room: the write is tried again.
+    void Retry();
 
     /// Bytes of all files created since this object was made, as they stand.
     int64_t Bytes() const;
@@ -52,11 +57,13 @@ private:
     int WaitForRoom(const WriterStatus& status);
 
     uint32_t set_ = 0;
+    Bell& bell_;
     mutable std::mutex mutex_;
     std::condition_variable changed_;
     std::deque<News> news_;
     bool newsLost_ = false;
     bool givenUp_ = false;
+    bool retry_ = false;
     std::atomic<bool> waiting_{false};
     std::atomic<int64_t> closedBytes_{0};
 };

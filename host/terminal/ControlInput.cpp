@@ -1,14 +1,10 @@
 #include "host/terminal/ControlInput.h"
 
-#include "host/convert/HostEvents.h"
-#include "writer/WriterStatus.h"
-
 #include <array>
 #include <cerrno>
 #include <csignal>
 #include <cstdint>
 #include <fmt/format.h>
-#include <memory>
 #include <mutex>
 #include <new>
 #include <poll.h>
@@ -18,6 +14,7 @@
 #include <system_error>
 #include <termios.h>
 #include <unistd.h>
+#include <utility>
 
 namespace movieconv {
 namespace {
@@ -67,7 +64,7 @@ void WriteAll(int descriptor, const std::string& text) {
 
 } // namespace
 
-ControlInput::ControlInput() {
+ControlInput::ControlInput(MainLoop& loop) : loop_(loop) {
     const sigset_t ours = OurSignals();
     pthread_sigmask(SIG_BLOCK, &ours, nullptr);
     for (const int failure : {SIGPIPE, SIGXFSZ, SIGTTIN}) // the write or read that fails tells it
@@ -88,11 +85,16 @@ ControlInput::~ControlInput() {
     close(wake_);
 }
 
-void ControlInput::Arm(bool keys, uint32_t writerSet) {
-    writerSet_ = writerSet;
+void ControlInput::Arm(bool keys, std::function<void(Command)> obey) {
+    obey_ = std::move(obey);
     wantsKeys_ = keys;
     FollowTerminal();
     armed_ = true;
+}
+
+void ControlInput::NoteFile(const std::string& temporaryPath) {
+    const std::lock_guard lock(fileMutex_);
+    file_ = temporaryPath;
 }
 
 void ControlInput::FollowTerminal() {
@@ -131,6 +133,13 @@ void ControlInput::Run() {
     }
 }
 
+void ControlInput::Post(Command command) {
+    try {
+        loop_.Post([this, command] { obey_(command); });
+    } catch (const std::bad_alloc&) { // the user asks once more
+    }
+}
+
 /// Those that are pending together came at one moment, however late they are read.
 void ControlInput::TakeSignals() {
     std::array<signalfd_siginfo, 8> pending{};
@@ -144,12 +153,12 @@ void ControlInput::TakeSignal(int signal, Clock::time_point now) {
     if (signal == SIGTSTP && !armed_) {
         Suspend();
     } else if (signal == SIGTSTP) {
-        PostHostEvent(EventKind::kSuspend);
+        Post(Command::kSuspend);
     } else if (!armed_ || (stopAsked_ && now - *stopAsked_ >= kSameRequest)) {
         LeaveAtOnce(signal);
     } else if (!stopAsked_) {
         stopAsked_ = now;
-        PostHostEvent(EventKind::kStop);
+        Post(Command::kStop);
     }
 }
 
@@ -163,22 +172,19 @@ void ControlInput::TakeKeys() {
     for (ssize_t i = 0; i < count; ++i) {
         const char key = keys[static_cast<std::size_t>(i)];
         if (key == ' ' || key == 'p' || key == 'P')
-            PostHostEvent(EventKind::kPauseKey);
+            Post(Command::kPauseKey);
         else if (key == 'q' || key == 'Q')
-            PostHostEvent(EventKind::kStop);
+            Post(Command::kStop);
     }
 }
 
 void ControlInput::LeaveAtOnce(int signal) {
     RestoreTerminal();
     try {
-        const auto status = std::make_unique<WriterStatus>();
-        if (armed_ && MWGetFileStatus(writerSet_, MWGetFileCount(writerSet_), status.get()) != 0 &&
-            status->szTemporaryPath[0] != '\0') {
+        const std::lock_guard lock(fileMutex_);
+        if (!file_.empty())
             WriteAll(STDERR_FILENO,
-                     fmt::format("\nmovieconv: left at once; what was written so far is in \"{}\"\n",
-                                 status->szTemporaryPath));
-        }
+                     fmt::format("\nmovieconv: left at once; what was written so far is in \"{}\"\n", file_));
     } catch (const std::bad_alloc&) { // leaving matters more than the message
     }
     // Ends as if the signal had not been caught, which the shell shows as 128 plus its number.

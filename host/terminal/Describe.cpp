@@ -1,6 +1,8 @@
 #include "host/terminal/Describe.h"
 
-#include "host/terminal/Units.h"
+#include "host/convert/Amounts.h"
+#include "host/convert/Formats.h"
+#include "media/MediaWriter.h"
 
 #include <cmath>
 #include <fmt/format.h>
@@ -33,6 +35,24 @@ std::string DescribePictures(const PictureStreamInfo& pictures, Certainty certai
     return text + (pictures.interlaced ? ", interlaced\n" : "\n");
 }
 
+template <std::size_t N>
+std::string CodecList(const uint32_t (&codes)[N]) {
+    std::string list;
+    for (const uint32_t code : codes) {
+        if (code == 0)
+            break;
+        list += (list.empty() ? "" : ", ") + CodeName(code);
+    }
+    return list.empty() ? "none" : list;
+}
+
+/// "mp4,m4v" as ".mp4, .m4v".
+std::string ExtensionList(std::string list) {
+    for (std::size_t comma = list.find(','); comma != std::string::npos; comma = list.find(',', comma + 1))
+        list.replace(comma, 1, ", .");
+    return "." + list;
+}
+
 } // namespace
 
 std::string Describe(const SourceInfo& source) {
@@ -48,6 +68,20 @@ std::string Describe(const SourceInfo& source) {
                         DescribeLength(source.sound->duration, source.certainty));
     } else {
         text += "sound:     none\n";
+    }
+    return text;
+}
+
+std::string ListFormats() {
+    std::string text;
+    for (const FileFormatInfo* format = MWGetFileFormatInfos(); format != nullptr && format->fccFormat != 0;
+         ++format) {
+        text += fmt::format("{:<5} {} ({})\n", CodeName(format->fccFormat), format->szName,
+                            ExtensionList(format->szExtensions));
+        if (format->bHasVideo != 0)
+            text += fmt::format("      pictures: {}\n", CodecList(format->fccVideoCodecs));
+        if (format->bHasAudio != 0)
+            text += fmt::format("      sound:    {}\n", CodecList(format->fccAudioCodecs));
     }
     return text;
 }

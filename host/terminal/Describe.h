@@ -1,4 +1,4 @@
-// What --info prints.
+// What --info and --list-formats print.
 #ifndef MOVIECONV_HOST_TERMINAL_DESCRIBE_H
 #define MOVIECONV_HOST_TERMINAL_DESCRIBE_H
 
@@ -10,6 +10,9 @@ namespace movieconv {
 
 /// The source in a few lines for people.
 std::string Describe(const SourceInfo& source);
+
+/// The table of file formats and codecs.
+std::string ListFormats();
 
 } // namespace movieconv
 

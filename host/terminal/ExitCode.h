@@ -1,8 +1,11 @@
-// How the program ends. The numbers are part of its interface; the man page lists them.
+// How the program ends, and what it adds to what a conversion tells. The numbers are part of its interface;
+// the man page lists them.
 #ifndef MOVIECONV_HOST_TERMINAL_EXITCODE_H
 #define MOVIECONV_HOST_TERMINAL_EXITCODE_H
 
-#include <stdexcept>
+#include "host/convert/Failure.h"
+#include "host/convert/Observer.h"
+
 #include <string>
 
 namespace movieconv {
@@ -17,15 +20,12 @@ enum class ExitCode : int {
     kStopped = 6,
 };
 
-/// A failure that ends the program: what, where and what to do, and the exit code for it.
-class Failure : public std::runtime_error {
-public:
-    Failure(ExitCode code, const std::string& text) : std::runtime_error(text), code_(code) {}
-    ExitCode Code() const { return code_; }
+ExitCode CodeOf(Category category);
+ExitCode CodeOf(const Verdict& verdict);
 
-private:
-    ExitCode code_;
-};
+/// What to tell the user of the program: with the option or the key that helps.
+std::string Explain(const Failure& failure);
+std::string Explain(const Warning& warning);
 
 } // namespace movieconv
 

@@ -55,14 +55,14 @@ void JsonReporter::Print(std::string_view event, const std::string& fields) cons
                                fields.empty() ? "" : ",", fields));
 }
 
-void JsonReporter::Start(const StartReport& report) {
+void JsonReporter::Started(const Start& report) {
     Print("start", fmt::format("\"input\":{},\"output\":{},\"length_s\":{}", JsonString(report.input),
                                JsonString(report.output),
                                Number(report.lengthIsKnown ? std::optional(report.length) : std::nullopt)));
 }
 
-void JsonReporter::Progress(const ProgressReport& report, bool milestone) {
-    if (!milestone && report.worked < nextAt_)
+void JsonReporter::Progressed(const Progress& report) {
+    if (!report.phaseChanged && report.worked < nextAt_)
         return;
     nextAt_ = report.worked + kInterval;
     Print("progress",
@@ -73,17 +73,17 @@ void JsonReporter::Progress(const ProgressReport& report, bool milestone) {
                       Number(report.finished), report.clip));
 }
 
-void JsonReporter::FileOpened(int number, const std::string& path) {
-    Print("clip_opened", fmt::format("\"number\":{},\"path\":{}", number, JsonString(path)));
+void JsonReporter::Opened(const OpenedFile& report) {
+    Print("clip_opened", fmt::format("\"number\":{},\"path\":{}", report.number, JsonString(report.path)));
 }
 
-void JsonReporter::FileClosed(const FileReport& report) {
+void JsonReporter::Closed(const ClosedFile& report) {
     Print("clip_closed", fmt::format("\"number\":{},\"path\":{},\"video_s\":{},\"audio_s\":{},\"bytes\":{}",
                                      report.number, JsonString(report.path), Number(report.videoSeconds),
                                      Number(report.audioSeconds), report.bytes));
 }
 
-void JsonReporter::Warning(const std::string& text) {
+void JsonReporter::Warn(const std::string& text) {
     Print("warning", fmt::format("\"text\":{}", JsonString(text)));
 }
 

@@ -13,11 +13,11 @@ class JsonReporter final : public Reporter {
 public:
     explicit JsonReporter(const StandardStreams& streams) : streams_(streams) {}
 
-    void Start(const StartReport& report) override;
-    void Progress(const ProgressReport& report, bool milestone) override;
-    void FileOpened(int number, const std::string& path) override;
-    void FileClosed(const FileReport& report) override;
-    void Warning(const std::string& text) override;
+    void Started(const Start& report) override;
+    void Progressed(const Progress& report) override;
+    void Opened(const OpenedFile& report) override;
+    void Closed(const ClosedFile& report) override;
+    void Warn(const std::string& text) override;
     void Error(const std::string& text) override;
     void End(const EndReport& report) override;
 

@@ -1,7 +1,9 @@
 #include "host/terminal/Options.h"
 
 #include "Common/Image/ImageConvert.h"
-#include "host/terminal/ExitCode.h"
+#include "host/convert/Failure.h"
+#include "host/convert/Formats.h"
+#include "host/terminal/Units.h"
 
 #include <CLI/CLI.hpp>
 #include <cstdio>
@@ -11,6 +13,8 @@
 
 namespace movieconv {
 namespace {
+
+constexpr std::chrono::seconds kPreviewInterval{1};
 
 /// An option whose text `parse` turns into a value; `notation` is what the message asks for.
 template <class Value, class Target>
@@ -41,41 +45,52 @@ CLI::Option* AddChoice(CLI::App& app, const std::string& name, Value& target,
     return app.add_option_function<std::string>(name, take, help)->type_name(list);
 }
 
+std::optional<uint32_t> ParseFormat(std::string_view name) {
+    const FileFormatInfo* format = FindFormat(name);
+    return format != nullptr ? std::optional(format->fccFormat) : std::nullopt;
+}
+
 void AddEncoding(CLI::App& app, Options& options) {
     const std::string group = "Format and codecs";
-    app.add_option("-f,--format", options.format,
-                   "File format, by code or extension; by default the\noutput's extension tells")
+    AddParsed(app, "-f,--format", ParseFormat, options.request.format,
+              "a file format; see \"movieconv --list-formats\"",
+              "File format, by code or extension; by default the\noutput's extension tells")
         ->type_name("NAME")
         ->group(group);
-    app.add_option("--video-codec", options.videoCodec, "Four-character code of the picture codec")
+    AddParsed(app, "--video-codec", ParseCode, options.request.videoCodec,
+              "a code of up to four characters; see \"movieconv --list-formats\"",
+              "Four-character code of the picture codec")
         ->type_name("CODE")
         ->group(group);
-    app.add_option("--audio-codec", options.audioCodec, "Four-character code of the sound codec")
+    AddParsed(app, "--audio-codec", ParseCode, options.request.audioCodec,
+              "a code of up to four characters; see \"movieconv --list-formats\"",
+              "Four-character code of the sound codec")
         ->type_name("CODE")
         ->group(group);
-    app.add_flag("--no-video", options.noVideo, "Leave the pictures out")->group(group);
-    app.add_flag("--no-audio", options.noAudio, "Leave the sound out")->group(group);
+    app.add_flag("--no-video", options.request.noVideo, "Leave the pictures out")->group(group);
+    app.add_flag("--no-audio", options.request.noAudio, "Leave the sound out")->group(group);
 }
 
 void AddPictures(CLI::App& app, Options& options) {
     const std::string group = "Pictures";
-    AddParsed(app, "--size", ParseSize, options.size, "a size from 2x2 to 32768x32768, such as 640x360",
-              "Picture size; by default the source's")
+    AddParsed(app, "--size", ParseSize, options.request.size,
+              "a size from 2x2 to 32768x32768, such as 640x360", "Picture size; by default the source's")
         ->type_name("WxH")
         ->group(group);
-    AddChoice<Fit>(app, "--fit", options.fit, {{"borders", Fit::kBorders}, {"stretch", Fit::kStretch}},
+    AddChoice<Fit>(app, "--fit", options.request.fit,
+                   {{"borders", Fit::kBorders}, {"stretch", Fit::kStretch}},
                    "How pictures of another shape fill it: with borders\n(default) or by stretching")
         ->group(group);
-    AddParsed(app, "--frame-rate", ParseFrameRate, options.frameRate,
+    AddParsed(app, "--frame-rate", ParseFrameRate, options.request.frameRate,
               "a frame rate up to 200, such as 25 or 30000/1001",
               "Pictures per second; by default the source's")
         ->type_name("N")
         ->group(group);
-    AddParsed(app, "--video-rate", ParseRate, options.videoRate,
+    AddParsed(app, "--video-rate", ParseRate, options.request.videoRate,
               "a bit rate up to 2147M, such as 512k or 1.5M", "Bits per second, as 1.5M (default 512k)")
         ->type_name("RATE")
         ->group(group);
-    AddParsed(app, "--video-max-rate", ParseRate, options.videoMaxRate,
+    AddParsed(app, "--video-max-rate", ParseRate, options.request.videoMaxRate,
               "a bit rate up to 2147M, such as 512k or 1.5M", "Upper bit rate: the rate becomes a target")
         ->type_name("RATE")
         ->group(group);
@@ -83,19 +98,19 @@ void AddPictures(CLI::App& app, Options& options) {
 
 void AddSound(CLI::App& app, Options& options) {
     const std::string group = "Sound";
-    app.add_option("--channels", options.channels, "Channels; by default the source's")
+    app.add_option("--channels", options.request.channels, "Channels; by default the source's")
         ->check(CLI::Range(1, 8).description(""))
         ->type_name("N")
         ->group(group);
-    app.add_option("--sample-rate", options.sampleRate, "Samples per second; by default the source's")
+    app.add_option("--sample-rate", options.request.sampleRate, "Samples per second; by default the source's")
         ->check(CLI::Range(4000, 384000).description(""))
         ->type_name("HZ")
         ->group(group);
-    AddParsed(app, "--audio-rate", ParseRate, options.audioRate, "a bit rate up to 2147M, such as 128k",
-              "Bits per second (default 128k)")
+    AddParsed(app, "--audio-rate", ParseRate, options.request.audioRate,
+              "a bit rate up to 2147M, such as 128k", "Bits per second (default 128k)")
         ->type_name("RATE")
         ->group(group);
-    AddParsed(app, "--audio-max-rate", ParseRate, options.audioMaxRate,
+    AddParsed(app, "--audio-max-rate", ParseRate, options.request.audioMaxRate,
               "a bit rate up to 2147M, such as 128k", "Upper bit rate: the rate becomes a target")
         ->type_name("RATE")
         ->group(group);
@@ -103,19 +118,19 @@ void AddSound(CLI::App& app, Options& options) {
 
 void AddRange(CLI::App& app, Options& options) {
     const std::string group = "What to convert";
-    AddParsed(app, "--begin", ParseTime, options.begin, "a time such as 83.5 or 0:01:23.5",
+    AddParsed(app, "--begin", ParseTime, options.request.begin, "a time such as 83.5 or 0:01:23.5",
               "Begin here; TIME is seconds or h:mm:ss.fff")
         ->type_name("TIME")
         ->group(group);
-    AddParsed(app, "--length", ParseTime, options.length, "a time such as 83.5 or 0:01:23.5",
+    AddParsed(app, "--length", ParseTime, options.request.length, "a time such as 83.5 or 0:01:23.5",
               "Convert so much; by default all the rest")
         ->type_name("TIME")
         ->group(group);
-    AddParsed(app, "--split", ParseTime, options.split, "a time such as 600 or 0:10:00",
+    AddParsed(app, "--split", ParseTime, options.request.split, "a time such as 600 or 0:10:00",
               "Write clips of this length: OUTPUT_00, OUTPUT_01, ...")
         ->type_name("TIME")
         ->group(group);
-    app.add_flag("--allow-playlists", options.playlists,
+    app.add_flag("--allow-playlists", options.request.playlists,
                  "Also read playlists, which may name movies in their\nfolder and below; by default they are "
                  "refused")
         ->group(group);
@@ -123,17 +138,19 @@ void AddRange(CLI::App& app, Options& options) {
 
 void AddOutput(CLI::App& app, Options& options) {
     const std::string group = "Output";
-    app.add_flag("-y,--overwrite", options.overwrite, "Replace an existing output; by default it is refused")
+    app.add_flag("-y,--overwrite", options.request.overwrite,
+                 "Replace an existing output; by default it is refused")
         ->group(group);
-    AddChoice<OnFull>(app, "--on-full", options.onFull, {{"stop", OnFull::kStop}, {"wait", OnFull::kWait}},
+    AddChoice<OnFull>(app, "--on-full", options.request.onFull,
+                      {{"stop", OnFull::kStop}, {"wait", OnFull::kWait}},
                       "On a full disk: stop (default), or wait until there is\nroom again")
         ->group(group);
     app.add_flag_callback(
-           "--keep-partial", [&] { options.keepPartial = true; },
+           "--keep-partial", [&] { options.request.keepPartial = true; },
            "After a failure keep the unfinished file, which\nplays (default)")
         ->group(group);
     app.add_flag_callback(
-           "--no-keep-partial", [&] { options.keepPartial = false; },
+           "--no-keep-partial", [&] { options.request.keepPartial = false; },
            "After a failure remove the unfinished file")
         ->group(group);
     app.add_option("--preview", options.preview, "Keep this PNG file showing the picture just written")
@@ -175,16 +192,16 @@ public:
 void RequireNames(const Options& options) {
     const bool needsInput = options.task != Task::kListFormats;
     const bool needsOutput = options.task == Task::kConvert || options.task == Task::kEstimate;
-    if (needsInput && options.input.empty())
-        throw Failure(ExitCode::kUsage, "INPUT is missing; try \"movieconv --help\"");
-    if (needsOutput && options.output.empty())
-        throw Failure(ExitCode::kUsage, "OUTPUT is missing; try \"movieconv --help\"");
-    if (options.noVideo && options.noAudio)
-        throw Failure(ExitCode::kUsage, "--no-video and --no-audio together leave nothing to convert");
-    if (options.length && *options.length < 0.001)
-        throw Failure(ExitCode::kUsage, "--length must be at least 0.001 seconds");
-    if (options.split && (*options.split < 0.1 || *options.split > 2'000'000))
-        throw Failure(ExitCode::kUsage, "--split takes from 0.1 to 2000000 seconds");
+    if (needsInput && options.request.input.empty())
+        throw Failure(Category::kRequest, "INPUT is missing; try \"movieconv --help\"");
+    if (needsOutput && options.request.output.empty())
+        throw Failure(Category::kRequest, "OUTPUT is missing; try \"movieconv --help\"");
+    if (options.request.noVideo && options.request.noAudio)
+        throw Failure(Category::kRequest, "--no-video and --no-audio together leave nothing to convert");
+    if (options.request.length && *options.request.length < 0.001)
+        throw Failure(Category::kRequest, "--length must be at least 0.001 seconds");
+    if (options.request.split && (*options.request.split < 0.1 || *options.request.split > 2'000'000))
+        throw Failure(Category::kRequest, "--split takes from 0.1 to 2000000 seconds");
 }
 
 /// The version, and what a report of a fault should say of the processor.
@@ -212,8 +229,9 @@ std::optional<Options> ParseOptions(int argc, char** argv) {
     app.set_help_flag("-h,--help", "Print this help")->group("Instead of converting");
     app.set_version_flag("--version", Version, "Print the version and the colour routines' level")
         ->group("Instead of converting");
-    app.add_option("INPUT", options.input, "The movie to convert, any that FFmpeg can read")->type_name("");
-    app.add_option("OUTPUT", options.output, "The file to make")->type_name("");
+    app.add_option("INPUT", options.request.input, "The movie to convert, any that FFmpeg can read")
+        ->type_name("");
+    app.add_option("OUTPUT", options.request.output, "The file to make")->type_name("");
     AddRange(app, options);
     AddEncoding(app, options);
     AddPictures(app, options);
@@ -226,9 +244,11 @@ std::optional<Options> ParseOptions(int argc, char** argv) {
         app.exit(asked);
         return std::nullopt;
     } catch (const CLI::ParseError& error) {
-        throw Failure(ExitCode::kUsage, fmt::format("{}; try \"movieconv --help\"", error.what()));
+        throw Failure(Category::kRequest, fmt::format("{}; try \"movieconv --help\"", error.what()));
     }
     RequireNames(options);
+    if (options.preview)
+        options.request.preview = kPreviewInterval;
     return options;
 }
 

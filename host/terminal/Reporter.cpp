@@ -1,9 +1,12 @@
 #include "host/terminal/Reporter.h"
 
+#include "host/convert/Amounts.h"
 #include "host/terminal/JsonReporter.h"
 #include "host/terminal/TextReporter.h"
 
+#include <algorithm>
 #include <cstdlib>
+#include <fmt/format.h>
 #include <string_view>
 
 namespace movieconv {
@@ -17,6 +20,28 @@ bool WantsColour() {
 }
 
 } // namespace
+
+void Reporter::Ended(const Verdict& verdict) {
+    EndReport end{};
+    end.code = CodeOf(verdict);
+    end.position = verdict.position;
+    end.worked = verdict.worked;
+    end.bytes = verdict.bytes;
+    end.files = verdict.files;
+    if (verdict.failure) {
+        end.outcome = "failed";
+        Error(Explain(*verdict.failure));
+    } else {
+        const bool done = verdict.outcome == Outcome::kDone;
+        end.outcome = done ? "done" : "stopped";
+        end.summary =
+            fmt::format("{}: {} converted in {} ({:.2f}x), {} in {}", done ? "100% done" : "stopped",
+                        FormatTime(end.position, true), FormatTime(end.worked, true),
+                        end.position / std::max(end.worked, 1e-3), FormatBytes(end.bytes),
+                        end.files == 1 ? "one file" : fmt::format("{} files", end.files));
+    }
+    End(end);
+}
 
 std::unique_ptr<Reporter> MakeReporter(const Options& options, const StandardStreams& streams) {
     if (options.progress == ProgressStyle::kJson)

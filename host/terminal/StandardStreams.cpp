@@ -1,7 +1,7 @@
 #include "host/terminal/StandardStreams.h"
 
-#include "host/convert/SideFile.h"
-#include "host/terminal/ExitCode.h"
+#include "host/convert/Failure.h"
+#include "host/terminal/SideFile.h"
 #include "logsink/LogSink.h"
 #include "text/Utf8.h"
 
@@ -26,8 +26,7 @@ constexpr std::string_view kLogHead = "movieconv log\n"; // by which a log is kn
 
 /// With the reason in errno.
 Failure CannotWriteLog(const std::string& path) {
-    return {ExitCode::kCannotWrite,
-            fmt::format("cannot write the log \"{}\": {}", path, std::strerror(errno))};
+    return {Category::kOutput, fmt::format("cannot write the log \"{}\": {}", path, std::strerror(errno))};
 }
 
 /// FFmpeg's messages, a line each, as they would be shown at its usual level.

@@ -1,6 +1,6 @@
 #include "host/terminal/TextReporter.h"
 
-#include "host/terminal/Units.h"
+#include "host/convert/Amounts.h"
 
 #include <algorithm>
 #include <array>
@@ -14,7 +14,7 @@ constexpr int kLineSeconds = 5;
 constexpr int kBarColumns = 20;
 constexpr std::string_view kEraseLine = "\r\x1b[K";
 
-std::string Left(const ProgressReport& report) {
+std::string Left(const Progress& report) {
     switch (report.phase) {
     case Phase::kPaused:
         return "paused";
@@ -37,7 +37,7 @@ std::string Bar(double percent) {
 
 } // namespace
 
-std::string ProgressText(const ProgressReport& report, int columns) {
+std::string ProgressText(const Progress& report, int columns) {
     // Tenths are cut, never rounded up: what is not done is not shown as done.
     const std::string percent = report.percent
                                     ? fmt::format("{:5.1f}%", std::floor(*report.percent * 10) / 10)
@@ -59,7 +59,7 @@ void QuietReporter::Error(const std::string& text) {
     streams_.PrintError(fmt::format("movieconv: error: {}\n", text));
 }
 
-void SparseReporter::Warning(const std::string& text) {
+void SparseReporter::Warn(const std::string& text) {
     Streams().PrintError(fmt::format("movieconv: warning: {}\n", text));
 }
 
@@ -68,14 +68,14 @@ void SparseReporter::End(const EndReport& report) {
         Streams().Print(report.summary + "\n");
 }
 
-void LineReporter::Start(const StartReport& report) {
+void LineReporter::Started(const Start& report) {
     const std::string length = report.lengthIsKnown ? FormatTime(report.length, true) : "length unknown";
     Streams().Print(fmt::format("{} -> {} ({})\n", report.input, report.output, length));
 }
 
-void LineReporter::Progress(const ProgressReport& report, bool milestone) {
+void LineReporter::Progressed(const Progress& report) {
     // Between clips the phase changes back and forth, which the line of the clip tells well enough.
-    const bool worthALine = milestone && report.phase != Phase::kConverting &&
+    const bool worthALine = report.phaseChanged && report.phase != Phase::kConverting &&
                             (report.phase != Phase::kFinishing || report.clip == 0);
     if (!worthALine && report.worked < nextAt_)
         return;
@@ -84,13 +84,13 @@ void LineReporter::Progress(const ProgressReport& report, bool milestone) {
     Streams().Print(ProgressText(report, kAnyWidth) + "\n");
 }
 
-void LineReporter::FileClosed(const FileReport& report) {
+void LineReporter::Closed(const ClosedFile& report) {
     Streams().Print(fmt::format("wrote {} ({}, {})\n", report.path,
                                 FormatTime(std::max(report.videoSeconds, report.audioSeconds), true),
                                 FormatBytes(report.bytes)));
 }
 
-void BarReporter::Progress(const ProgressReport& report, bool /*milestone*/) {
+void BarReporter::Progressed(const Progress& report) {
     const int columns = Streams().Columns();
     std::string line = ProgressText(report, columns);
     if (report.percent && line.size() + kBarColumns + 3 < static_cast<std::size_t>(columns))
@@ -101,14 +101,14 @@ void BarReporter::Progress(const ProgressReport& report, bool /*milestone*/) {
     drawn_ = true;
 }
 
-void BarReporter::FileClosed(const FileReport& report) {
+void BarReporter::Closed(const ClosedFile& report) {
     EraseLine();
-    LineReporter::FileClosed(report);
+    LineReporter::Closed(report);
 }
 
-void BarReporter::Warning(const std::string& text) {
+void BarReporter::Warn(const std::string& text) {
     EraseLine();
-    LineReporter::Warning(text);
+    LineReporter::Warn(text);
 }
 
 void BarReporter::Error(const std::string& text) {

@@ -25,7 +25,7 @@ private:
 class SparseReporter : public QuietReporter {
 public:
     using QuietReporter::QuietReporter;
-    void Warning(const std::string& text) override;
+    void Warn(const std::string& text) override;
     void End(const EndReport& report) override;
 };
 
@@ -33,9 +33,9 @@ public:
 class LineReporter : public SparseReporter {
 public:
     using SparseReporter::SparseReporter;
-    void Start(const StartReport& report) override;
-    void Progress(const ProgressReport& report, bool milestone) override;
-    void FileClosed(const FileReport& report) override;
+    void Started(const Start& report) override;
+    void Progressed(const Progress& report) override;
+    void Closed(const ClosedFile& report) override;
 
 private:
     double nextAt_ = 0; // seconds of work
@@ -45,9 +45,9 @@ private:
 class BarReporter : public LineReporter {
 public:
     BarReporter(const StandardStreams& streams, bool colour) : LineReporter(streams), colour_(colour) {}
-    void Progress(const ProgressReport& report, bool milestone) override;
-    void FileClosed(const FileReport& report) override;
-    void Warning(const std::string& text) override;
+    void Progressed(const Progress& report) override;
+    void Closed(const ClosedFile& report) override;
+    void Warn(const std::string& text) override;
     void Error(const std::string& text) override;
     void End(const EndReport& report) override;
     void LeaveLine() override;
@@ -60,7 +60,7 @@ private:
 };
 
 /// The figures of one progress line, at most `columns` wide: what does not fit is left out from the right.
-std::string ProgressText(const ProgressReport& report, int columns);
+std::string ProgressText(const Progress& report, int columns);
 
 } // namespace movieconv
 

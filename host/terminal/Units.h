@@ -1,10 +1,11 @@
-// The notations of the command line and the progress display: times, bit rates, picture sizes, byte counts.
+// The notations of the command line: times, bit rates, picture sizes.
 #ifndef MOVIECONV_HOST_TERMINAL_UNITS_H
 #define MOVIECONV_HOST_TERMINAL_UNITS_H
 
+#include "host/convert/Request.h"
+
 #include <cstdint>
 #include <optional>
-#include <string>
 #include <string_view>
 
 namespace movieconv {
@@ -15,22 +16,11 @@ std::optional<double> ParseTime(std::string_view text);
 /// Bits per second from "512000", "512k" or "1.5M" (powers of 1000). Nothing for anything else, 0 included.
 std::optional<int32_t> ParseRate(std::string_view text);
 
-struct Size {
-    int32_t width;
-    int32_t height;
-};
-
 /// From "640x360", both from 2 to 32768. Nothing for anything else.
 std::optional<Size> ParseSize(std::string_view text);
 
 /// Pictures per second from "25", "23.976" or "30000/1001", up to 200. Nothing for anything else.
 std::optional<double> ParseFrameRate(std::string_view text);
-
-/// "h:mm:ss", with milliseconds "h:mm:ss.fff".
-std::string FormatTime(double seconds, bool milliseconds = false);
-
-/// "812 B", "3.1 kB", "41.3 MB", powers of 1000.
-std::string FormatBytes(int64_t bytes);
 
 } // namespace movieconv
 

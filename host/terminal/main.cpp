@@ -1,13 +1,13 @@
-#include "host/convert/Conversion.h"
-#include "host/convert/EncodePlan.h"
-#include "host/convert/Formats.h"
-#include "host/convert/OutputCheck.h"
+#include "host/convert/Amounts.h"
+#include "host/convert/Room.h"
+#include "host/convert/Sources.h"
 #include "host/terminal/ControlInput.h"
 #include "host/terminal/Describe.h"
-#include "host/terminal/Reporter.h"
+#include "host/terminal/MainLoop.h"
+#include "host/terminal/Options.h"
+#include "host/terminal/Session.h"
+#include "host/terminal/SideFileCheck.h"
 #include "host/terminal/StandardStreams.h"
-#include "host/terminal/Units.h"
-#include "text/Path.h"
 
 #include <cerrno>
 #include <cstdio>
@@ -38,52 +38,38 @@ void OpenStandardDescriptors() {
 /// For what was asked for as a text.
 void PrintWhole(const StandardStreams& streams, const std::string& text) {
     if (!streams.Print(text)) {
-        throw Failure(ExitCode::kCannotWrite,
+        throw Failure(Category::kOutput,
                       fmt::format("cannot write to the standard output: {}", std::strerror(errno)));
     }
 }
 
-ExitCode Estimate(const Options& options, Movie& movie, const StandardStreams& streams) {
-    if (movie.Info().certainty == Certainty::kGuessed && !options.length) {
-        throw Failure(ExitCode::kUsage,
-                      fmt::format("\"{}\" does not tell how long it is; use --length", options.input));
+ExitCode Estimate(const Options& options, const StandardStreams& streams) {
+    const Room room = EstimateRoom(options.request);
+    PrintWhole(streams, fmt::format("needs about {} for {} of output\n", FormatBytes(room.needed),
+                                    FormatTime(room.length, true)));
+    if (room.free < 0) {
+        throw Failure(Category::kOutput,
+                      fmt::format("the output's folder \"{}\" cannot be used", room.folder));
     }
-    const double length = LengthToConvert(options, movie.Info());
-    const Converter converter = MakeConverter(options, movie);
-    EncodeParam param{};
-    MCGetEncodeParam(converter.get(), &param);
-    const int64_t needed = MCGetEstimateDiskSpaceEx(&param, length);
-    const std::string folder = text::FolderOf(options.output);
-    const int64_t free = FreeBytes(folder);
-    PrintWhole(streams, fmt::format("needs about {} for {} of output\n", FormatBytes(needed),
-                                    FormatTime(length, true)));
-    if (free < 0) {
-        throw Failure(ExitCode::kCannotWrite,
-                      fmt::format("the output's folder \"{}\" cannot be used", folder));
-    }
-    PrintWhole(streams, fmt::format("{} are free in \"{}\"\n", FormatBytes(free), folder));
-    return needed <= free ? ExitCode::kDone : ExitCode::kNoSpace;
+    PrintWhole(streams, fmt::format("{} are free in \"{}\"\n", FormatBytes(room.free), room.folder));
+    return room.needed <= room.free ? ExitCode::kDone : ExitCode::kNoSpace;
 }
 
-ExitCode Perform(const Options& options, const StandardStreams& streams, ControlInput& control) {
-    const SourceChoice choice{
-        .pictures = !options.noVideo, .sound = !options.noAudio, .playlists = options.playlists};
-    if (options.task == Task::kListFormats) {
+ExitCode Perform(const Options& options, const StandardStreams& streams, MainLoop& loop,
+                 ControlInput& control) {
+    switch (options.task) {
+    case Task::kListFormats:
         PrintWhole(streams, ListFormats());
         return ExitCode::kDone;
-    }
-    if (options.task == Task::kInfo) {
-        PrintWhole(streams, Describe(Source(options.input, choice).Info()));
+    case Task::kInfo:
+        PrintWhole(streams, Describe(LookAtSource(options.request)));
         return ExitCode::kDone;
+    case Task::kEstimate:
+        return Estimate(options, streams);
+    case Task::kConvert:
+        break;
     }
-    ChooseFormat(options);
-    if (options.task == Task::kConvert)
-        CheckOutput(options);
-    Movie movie(options.input, choice);
-    if (options.task == Task::kEstimate)
-        return Estimate(options, movie, streams);
-    const std::unique_ptr<Reporter> reporter = MakeReporter(options, streams);
-    return Conversion(options, movie, *reporter, control).Run();
+    return Session(options, streams, loop, control).Run();
 }
 
 int Main(int argc, char** argv) {
@@ -91,14 +77,17 @@ int Main(int argc, char** argv) {
     if (!options)
         return static_cast<int>(ExitCode::kDone);
     CheckSideFiles(*options);
-    ControlInput control;
-    const StandardStreams streams(options->log, options->overwrite);
+    MainLoop loop;
+    ControlInput control(loop);
+    const StandardStreams streams(options->log, options->request.overwrite);
+    return static_cast<int>(Perform(*options, streams, loop, control));
+}
+
+void Tell(const Failure& failure) {
     try {
-        return static_cast<int>(Perform(*options, streams, control));
-    } catch (const PlaylistError& error) {
-        throw Failure(ExitCode::kCannotRead, fmt::format("{}; see --allow-playlists", error.what()));
-    } catch (const SourceError& error) {
-        throw Failure(ExitCode::kCannotRead, error.what());
+        std::fprintf(stderr, "movieconv: error: %s\n", Explain(failure).c_str());
+    } catch (const std::bad_alloc&) {
+        std::fprintf(stderr, "movieconv: error: there is not enough memory\n");
     }
 }
 
@@ -111,8 +100,8 @@ int main(int argc, char** argv) {
     try {
         return movieconv::Main(argc, argv);
     } catch (const movieconv::Failure& failure) {
-        std::fprintf(stderr, "movieconv: error: %s\n", failure.what());
-        return static_cast<int>(failure.Code());
+        movieconv::Tell(failure);
+        return static_cast<int>(movieconv::CodeOf(failure.Kind()));
     } catch (const std::bad_alloc&) {
         std::fputs("movieconv: error: there is not enough memory\n", stderr);
         return static_cast<int>(movieconv::ExitCode::kInternal);

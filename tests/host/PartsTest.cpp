@@ -1,3 +1,4 @@
+#include "host/convert/Amounts.h"
 #include "host/convert/SpeedMeter.h"
 #include "host/convert/WorkClock.h"
 #include "host/terminal/JsonReporter.h"
@@ -71,7 +72,7 @@ TEST(SpeedMeter, FollowsTheLastTenSeconds) {
 }
 
 TEST(ProgressText, FitsTheTerminalAndNeverRoundsUp) {
-    ProgressReport report{};
+    Progress report;
     report.percent = 42.99;
     report.position = 61;
     report.length = 3600;

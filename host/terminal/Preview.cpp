@@ -1,8 +1,7 @@
-#include "host/convert/Preview.h"
+#include "host/terminal/Preview.h"
 
-#include "Common/Image/ImageConvert.h"
 #include "ffmpeg/AvHandles.h"
-#include "host/terminal/ExitCode.h"
+#include "host/convert/Failure.h"
 
 extern "C" {
 #include <libavutil/crc.h>
@@ -52,18 +51,6 @@ FileId IdOf(std::FILE* file) {
     struct stat status {};
     fstat(fileno(file), &status);
     return {status.st_dev, status.st_ino};
-}
-
-std::size_t Half(int size) {
-    return static_cast<std::size_t>(size + 1) / 2;
-}
-
-void CopyPlane(std::vector<uint8_t>& target, const uint8_t* plane, int pitch, std::size_t width,
-               std::size_t height) {
-    for (std::size_t y = 0; y < height; ++y) {
-        const uint8_t* row = plane + static_cast<ptrdiff_t>(y) * pitch;
-        target.insert(target.end(), row, row + width);
-    }
 }
 
 /// Blue, green, red, 255, top row first, to the red, green, blue that PNG wants.
@@ -125,8 +112,8 @@ std::optional<FileId> CheckPreview(const std::string& path, bool overwrite) {
         RequireWritable(file, "--preview", path, "a preview", overwrite);
         return file.kind == SideFile::Kind::kMissing ? std::nullopt : std::optional(file.id);
     } catch (const std::system_error& error) {
-        throw Failure(ExitCode::kCannotWrite, fmt::format("--preview \"{}\" cannot be looked at: {}", path,
-                                                          std::strerror(error.code().value())));
+        throw Failure(Category::kOutput, fmt::format("--preview \"{}\" cannot be looked at: {}", path,
+                                                     std::strerror(error.code().value())));
     }
 }
 
@@ -137,23 +124,10 @@ Preview::~Preview() {
     Join();
 }
 
-void Preview::Offer(const VideoImage& image) noexcept {
-    if (image.nWidth <= 0 || image.nHeight <= 0)
-        return;
-    try {
+void Preview::Offer(std::shared_ptr<const ShownPicture> picture) noexcept {
+    {
         const std::lock_guard lock(mutex_);
-        fresh_ = false;
-        latest_.width = image.nWidth;
-        latest_.height = image.nHeight;
-        latest_.planes.clear();
-        const auto width = static_cast<std::size_t>(image.nWidth);
-        const auto height = static_cast<std::size_t>(image.nHeight);
-        CopyPlane(latest_.planes, image.pY, image.nPitchY, width, height);
-        CopyPlane(latest_.planes, image.pU, image.nPitchU, Half(image.nWidth), Half(image.nHeight));
-        CopyPlane(latest_.planes, image.pV, image.nPitchV, Half(image.nWidth), Half(image.nHeight));
-        fresh_ = true;
-    } catch (const std::bad_alloc&) {
-        return;
+        latest_ = std::move(picture);
     }
     changed_.notify_all();
 }
@@ -174,17 +148,15 @@ std::string Preview::Finish() {
 }
 
 void Preview::Run() {
-    Picture picture;
     std::unique_lock lock(mutex_);
     for (;;) {
-        changed_.wait(lock, [&] { return fresh_ || finishing_; });
-        if (!fresh_)
+        changed_.wait(lock, [&] { return latest_ || finishing_; });
+        if (!latest_)
             return;
-        fresh_ = false;
-        std::swap(picture, latest_);
+        const std::shared_ptr<const ShownPicture> picture = std::move(latest_);
         lock.unlock();
         try {
-            Write(picture);
+            Write(*picture);
         } catch (const std::bad_alloc&) {
             failure_ = "no memory"; // short enough to need none
         }
@@ -218,23 +190,8 @@ std::string Preview::ReplaceFile(const AVPacket& content) {
     return reason;
 }
 
-void Preview::Write(Picture& picture) {
-    tagBITMAPINFOHEADER header{};
-    header.biSize = sizeof header;
-    header.biWidth = picture.width;
-    header.biHeight = picture.height;
-    header.biPlanes = 1;
-    header.biBitCount = 32;
-    const auto width = static_cast<std::size_t>(picture.width);
-    const auto height = static_cast<std::size_t>(picture.height);
-    std::vector<uint8_t> bgra(width * height * 4);
-    uint8_t* luma = picture.planes.data();
-    uint8_t* blue = luma + width * height;
-    uint8_t* red = blue + Half(picture.width) * Half(picture.height);
-    const int chromaPitch = static_cast<int>(Half(picture.width));
-    Yuv420_2_Argb(&header, bgra.data(), luma, blue, red, picture.width, chromaPitch, chromaPitch);
-
-    const av::Frame rgb = ToRgb(bgra, picture.width, picture.height);
+void Preview::Write(const ShownPicture& picture) {
+    const av::Frame rgb = ToRgb(picture.bgra, picture.width, picture.height);
     const av::Packet png = rgb ? EncodePng(*rgb) : nullptr;
     std::string reason = png ? ReplaceFile(*png) : "the picture could not be encoded";
     if (failure_.empty())

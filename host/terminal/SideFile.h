@@ -1,6 +1,6 @@
 // Files beside the output, the preview and the log: what may be replaced, and that nothing else is.
-#ifndef MOVIECONV_HOST_CONVERT_SIDEFILE_H
-#define MOVIECONV_HOST_CONVERT_SIDEFILE_H
+#ifndef MOVIECONV_HOST_TERMINAL_SIDEFILE_H
+#define MOVIECONV_HOST_TERMINAL_SIDEFILE_H
 
 #include <optional>
 #include <string>

@@ -1,17 +1,16 @@
 // Keeps a PNG file of the picture just written.
-#ifndef MOVIECONV_HOST_CONVERT_PREVIEW_H
-#define MOVIECONV_HOST_CONVERT_PREVIEW_H
+#ifndef MOVIECONV_HOST_TERMINAL_PREVIEW_H
+#define MOVIECONV_HOST_TERMINAL_PREVIEW_H
 
-#include "host/convert/SideFile.h"
-#include "media/MediaRecords.h"
+#include "host/convert/Observer.h"
+#include "host/terminal/SideFile.h"
 
 #include <condition_variable>
-#include <cstdint>
+#include <memory>
 #include <mutex>
 #include <optional>
 #include <string>
 #include <thread>
-#include <vector>
 
 struct AVPacket;
 
@@ -32,30 +31,23 @@ public:
     Preview& operator=(const Preview&) = delete;
     ~Preview();
 
-    /// Copies a planar 4:2:0 picture and returns; without memory it is not shown. Any one thread.
-    void Offer(const VideoImage& image) noexcept;
+    /// The main thread.
+    void Offer(std::shared_ptr<const ShownPicture> picture) noexcept;
 
     /// Waits until the last picture is written. What went wrong first; empty when nothing did.
     std::string Finish();
 
 private:
-    struct Picture {
-        int width = 0;
-        int height = 0;
-        std::vector<uint8_t> planes; // Y, U, V without gaps
-    };
-
     void Run();
     void Join();
-    void Write(Picture& picture);
+    void Write(const ShownPicture& picture);
     std::string ReplaceFile(const AVPacket& content);
 
     const std::string path_;
     std::optional<FileId> replaceable_; // by the next picture
     std::mutex mutex_;
     std::condition_variable changed_;
-    Picture latest_;
-    bool fresh_ = false;
+    std::shared_ptr<const ShownPicture> latest_; // null once written
     bool finishing_ = false;
     std::string failure_;
     std::thread thread_;

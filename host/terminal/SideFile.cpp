@@ -1,6 +1,6 @@
-#include "host/convert/SideFile.h"
+#include "host/terminal/SideFile.h"
 
-#include "host/terminal/ExitCode.h"
+#include "host/convert/Failure.h"
 
 #include <cerrno>
 #include <cstdio>
@@ -73,7 +73,7 @@ SideFile LookAtSideFile(const std::string& path, std::string_view mark, off_t of
 void RequireWritable(const SideFile& file, const char* option, const std::string& path, const char* what,
                      bool overwrite) {
     const auto refuse = [&](const std::string& reason) {
-        throw Failure(ExitCode::kCannotWrite, fmt::format("{} \"{}\" is {}", option, path, reason));
+        throw Failure(Category::kOutput, fmt::format("{} \"{}\" is {}", option, path, reason));
     };
     switch (file.kind) {
     case SideFile::Kind::kLink:

@@ -1,0 +1,281 @@
+#include "host/convert/Course.h"
+
+#include "host/convert/Amounts.h"
+#include "host/convert/EncodePlan.h"
+#include "host/convert/Room.h"
+#include "text/Path.h"
+
+#include <algorithm>
+#include <chrono>
+#include <cmath>
+#include <filesystem>
+#include <fmt/format.h>
+#include <limits>
+
+namespace movieconv {
+namespace {
+
+constexpr std::chrono::milliseconds kTick{500};
+constexpr std::chrono::milliseconds kShortestInterval{100}; // between two reports of progress
+constexpr std::chrono::milliseconds kSuspicious{1500};      // between two ticks: the process was suspended
+constexpr double kMostPercent = 99.9;                       // until the file has its name
+constexpr double kEarlyEnd = 1; // seconds by which a source may fall short of the length asked for
+
+/// Whether the file is shorter than when it was opened.
+bool HasShrunk(const SourceInfo& source) {
+    std::error_code unknown;
+    const auto bytes = std::filesystem::file_size(source.path, unknown);
+    return !unknown && static_cast<int64_t>(bytes) < source.bytes;
+}
+
+WorkClock::Time Now() {
+    return std::chrono::steady_clock::now();
+}
+
+} // namespace
+
+Course::Course(const Request& request, Movie& movie, Wishes& wishes, Observer& observer)
+    : request_(request),
+      movie_(movie),
+      wishes_(wishes),
+      observer_(observer),
+      length_(LengthToConvert(request, movie.Info())),
+      watch_(request, movie.Info(), wishes.bell),
+      files_(observer),
+      engine_(MakeEngine(request, movie, watch_.OptionSet())),
+      clock_(Now()) {
+    if (request.length)
+        movie.EndPicturesAt(request.begin + length_);
+}
+
+Verdict Course::Run() {
+    const bool lengthKnown = movie_.Info().certainty != Certainty::kGuessed;
+    observer_.Started({request_.input, request_.output, length_, lengthKnown});
+    if (lengthKnown || request_.length)
+        WarnOfSmallRoom();
+    clock_.Skip(Now());
+    if (MCStart(engine_.get(), request_.begin, request_.length.value_or(0), EngineWindow(), OnProgress,
+                this) != 0)
+        throw Failure(Category::kInternal, "the conversion could not be started");
+    if (MCWait(engine_.get(), 0) == 0 && outcome_ == kNone)
+        throw Failure(Category::kInternal, "no thread could be started for the conversion");
+    try {
+        WaitForEnd();
+    } catch (...) {
+        Stop(); // lest the engine's end wait for a slow source
+        throw;
+    }
+    MCWait(engine_.get(), MC_INFINITE);
+    return Conclude();
+}
+
+void Course::WarnOfSmallRoom() {
+    EncodeParam param{};
+    MCGetEncodeParam(engine_.get(), &param);
+    const int64_t needed = MCGetEstimateDiskSpaceEx(&param, length_);
+    const int64_t free = FreeBytes(text::FolderOf(request_.output));
+    if (free >= 0 && free < needed) {
+        observer_.Warned({Warning::Kind::kSmallRoom,
+                          fmt::format("\"{}\" needs about {}, but only {} are free", request_.output,
+                                      FormatBytes(needed), FormatBytes(free))});
+    }
+}
+
+/// The engine's worker calls this.
+unsigned Course::OnProgress(void* context, unsigned kind, unsigned value, uintptr_t info) {
+    auto* course = static_cast<Course*>(context);
+    if (const auto* progress = reinterpret_cast<const ProgressInfo*>(info)) {
+        course->position_ = progress->dPosition;
+        if (progress->pPreviewImage != nullptr)
+            course->wishes_.pictures.Offer(*progress->pPreviewImage);
+    }
+    if (kind == 1)
+        course->outcome_ = static_cast<int>(value);
+    course->wishes_.bell.Ring();
+    return 1;
+}
+
+void Course::WaitForEnd() {
+    while (outcome_ == kNone) {
+        wishes_.bell.Wait(paused_ ? std::nullopt : std::optional(kTick));
+        UpdateClock();
+        FollowWishes();
+        TakeNews();
+        Show();
+        DiscardEngineEvents();
+        if (outcome_ == kNone && watch_.FileVanished())
+            Stop(); // whatever else were converted would be lost
+        if (outcome_ == kNone)
+            ReportProgress();
+    }
+}
+
+void Course::UpdateClock() {
+    const WorkClock::Time now = Now();
+    if (now - clock_.Last() > kSuspicious)
+        clock_.Skip(now);
+    if (paused_ || watch_.WaitsForRoom())
+        clock_.Stand(now);
+    else
+        clock_.Go(now);
+}
+
+void Course::FollowWishes() {
+    if (wishes_.stop && !userStopped_) {
+        userStopped_ = true;
+        Stop();
+    }
+    if (!userStopped_ && wishes_.pause != paused_)
+        SetPaused(wishes_.pause);
+    if (wishes_.giveUpWrite.exchange(false))
+        watch_.GiveUp();
+    if (wishes_.retryWrite.exchange(false))
+        watch_.Retry();
+}
+
+void Course::TakeNews() {
+    while (const auto news = watch_.Take())
+        if (!files_.Enter(*news))
+            Stop();
+}
+
+void Course::Show() {
+    MCEnablePreview(engine_.get(), wishes_.pictures.Wants() ? 1 : 0);
+    if (const auto picture = wishes_.pictures.Take())
+        observer_.Showed(picture);
+}
+
+/// Ends the conversion; what was written so far is finished as a file.
+void Course::Stop() {
+    watch_.GiveUp();
+    MCAbort(engine_.get());
+    movie_.Stop();
+    paused_ = false;
+}
+
+void Course::SetPaused(bool pause) {
+    if (pause)
+        paused_ = MCPause(engine_.get()) > 0;
+    else
+        MCResume(engine_.get());
+    paused_ = paused_ && pause;
+}
+
+/// Seconds converted when the movie is at `position`. A picture can reach beyond the length that was asked
+/// for, and a movie beyond the one it announces.
+double Course::Converted(double position) const {
+    return std::clamp(position, 0.0, request_.length ? length_ : std::numeric_limits<double>::max());
+}
+
+Progress Course::Figures() {
+    Progress report;
+    // While the rest of the sound is converted after the last picture, only the sound tells how far it is.
+    report.position = Converted(std::max(position_.load(), movie_.SoundSeconds()));
+    report.length = length_;
+    report.worked = clock_.Seconds();
+    speed_.Add(report.worked, report.position);
+    report.speed = speed_.Speed();
+    if (movie_.Info().certainty != Certainty::kGuessed && length_ > 0) {
+        report.percent = std::min(report.position / length_ * 100, kMostPercent);
+        report.left = speed_.Left(length_);
+    }
+    report.bytes = watch_.Bytes();
+    report.finished = files_.Finishing().value_or(0);
+    report.clip = request_.split ? files_.Opened() : 0;
+    return report;
+}
+
+Phase Course::CurrentPhase() const {
+    return watch_.WaitsForRoom() ? Phase::kWaitingForRoom
+           : paused_             ? Phase::kPaused
+           : files_.Finishing()  ? Phase::kFinishing
+                                 : Phase::kConverting;
+}
+
+void Course::ReportProgress() {
+    const WorkClock::Time now = Now();
+    const Phase phase = CurrentPhase();
+    const bool changed = phase != toldPhase_;
+    if (!changed && now - toldAt_ < kShortestInterval)
+        return;
+    if (changed && phase == Phase::kWaitingForRoom) {
+        observer_.Warned(
+            {Warning::Kind::kWaitsForRoom,
+             fmt::format("no space is left for \"{}\"; waiting until there is room", request_.output)});
+    }
+    toldPhase_ = phase;
+    toldAt_ = now;
+    Progress report = Figures();
+    report.phase = phase;
+    report.phaseChanged = changed;
+    observer_.Progressed(report);
+}
+
+Verdict Course::Conclude() {
+    TakeNews();
+    DiscardEngineEvents();
+    if (const VideoImage* last = movie_.LastPicture(); last != nullptr && wishes_.pictures.Wants())
+        wishes_.pictures.OfferLast(*last); // the engine shows but some
+    Show();
+    ReportComplaints();
+    Verdict verdict;
+    verdict.failure = FindFailure();
+    verdict.outcome = verdict.failure                               ? Outcome::kFailed
+                      : userStopped_ && outcome_ == kOutcomeStopped ? Outcome::kStopped
+                                                                    : Outcome::kDone;
+    verdict.position = Converted(position_);
+    verdict.worked = clock_.Seconds();
+    verdict.bytes = files_.Bytes();
+    verdict.files = files_.Complete();
+    return verdict;
+}
+
+/// What went wrong, by the writer's word, the engine's and the source's.
+std::optional<Failure> Course::FindFailure() {
+    if (files_.FirstFailure())
+        return files_.FirstFailure();
+    std::string reason = movie_.ReadError();
+    if (files_.Complete() == 0) { // the writer keeps no empty file
+        if (userStopped_ && reason.empty())
+            return std::nullopt;
+        return Failure(Category::kSource,
+                       reason.empty() ? fmt::format("\"{}\" holds nothing to convert", request_.input)
+                                      : fmt::format("cannot read \"{}\": {}", request_.input, reason));
+    }
+    if (reason.empty())
+        reason = WhyItEndedEarly();
+    if (!reason.empty() && !userStopped_) {
+        return Failure(Category::kSource,
+                       fmt::format("reading \"{}\" failed after {}: {}; what was read is converted",
+                                   request_.input, FormatTime(request_.begin + position_, true), reason));
+    }
+    if (outcome_ == kOutcomeFailed) {
+        return Failure(Category::kInternal,
+                       fmt::format("the conversion broke off after {}, for want of memory",
+                                   FormatTime(request_.begin + position_, true)));
+    }
+    return std::nullopt;
+}
+
+/// Why the source ended before what it promises, and before the length that was asked for; empty when it did
+/// not.
+std::string Course::WhyItEndedEarly() const {
+    const std::optional<Shortfall> missing = movie_.Missing();
+    const double converted = std::max(position_.load(), movie_.SoundSeconds());
+    const bool lengthReached = request_.length && length_ - converted <= kEarlyEnd;
+    if (!missing || lengthReached || outcome_ != kOutcomeCompleted)
+        return {};
+    if (HasShrunk(movie_.Info()))
+        return "the file was cut meanwhile";
+    if (missing->announced <= 0)
+        return "it is cut off";
+    return fmt::format("{}it ends at {} although it announces {}", missing->cutOff ? "it is cut off: " : "",
+                       FormatTime(missing->reached, true), FormatTime(missing->announced, true));
+}
+
+void Course::ReportComplaints() {
+    for (const std::string& complaint : movie_.Complaints())
+        observer_.Warned({Warning::Kind::kSource, fmt::format("\"{}\": {}", request_.input, complaint)});
+}
+
+} // namespace movieconv

@@ -1,0 +1,91 @@
+// The course of one conversion, from the first look at the output to the verdict. It drives the engine
+// through its MC functions; the engine's worker and the media writer's threads tell what happens.
+#ifndef MOVIECONV_HOST_CONVERT_COURSE_H
+#define MOVIECONV_HOST_CONVERT_COURSE_H
+
+#include "host/convert/Bell.h"
+#include "host/convert/Engine.h"
+#include "host/convert/FileLedger.h"
+#include "host/convert/Observer.h"
+#include "host/convert/PictureTap.h"
+#include "host/convert/Request.h"
+#include "host/convert/SpeedMeter.h"
+#include "host/convert/WorkClock.h"
+#include "host/convert/WriterWatch.h"
+#include "host/source/Movie.h"
+
+#include <atomic>
+#include <optional>
+#include <string>
+
+namespace movieconv {
+
+/// What the front end wants of a conversion. Set on any thread, and then the bell is rung.
+struct Wishes {
+    explicit Wishes(PictureTap::Interval preview) : pictures(preview) {}
+
+    std::atomic<bool> stop{false};
+    std::atomic<bool> pause{false};
+    std::atomic<bool> retryWrite{false};
+    std::atomic<bool> giveUpWrite{false};
+    PictureTap pictures;
+    Bell bell;
+};
+
+/// Lives on one thread.
+class Course {
+public:
+    /// Opens nothing yet but the engine. Throws Failure when the request does not fit the movie.
+    Course(const Request& request, Movie& movie, Wishes& wishes, Observer& observer);
+    Course(const Course&) = delete;
+    Course& operator=(const Course&) = delete;
+
+    /// Converts and tells. Throws Failure when it cannot begin.
+    Verdict Run();
+
+private:
+    static constexpr int kNone = -1;
+
+    static unsigned OnProgress(void* context, unsigned kind, unsigned value, uintptr_t info);
+
+    void WarnOfSmallRoom();
+    void WaitForEnd();
+    void FollowWishes();
+    void TakeNews();
+    void Show();
+    void Stop();
+    void SetPaused(bool pause);
+    void UpdateClock();
+    Progress Figures();
+    Phase CurrentPhase() const;
+    void ReportProgress();
+    Verdict Conclude();
+    std::optional<Failure> FindFailure();
+    double Converted(double position) const;
+    std::string WhyItEndedEarly() const;
+    void ReportComplaints();
+
+    const Request& request_;
+    Movie& movie_;
+    Wishes& wishes_;
+    Observer& observer_;
+    const double length_;
+    WriterWatch watch_;
+    FileLedger files_;
+    Engine engine_;
+
+    // The engine's worker sets these.
+    std::atomic<double> position_{0}; // in seconds
+    std::atomic<int> outcome_{kNone}; // once the worker has nothing more to say
+
+    WorkClock clock_;
+    SpeedMeter speed_;
+    bool paused_ = false;
+    bool userStopped_ = false;
+    Phase toldPhase_ = Phase::kConverting;
+    WorkClock::Time toldAt_{};
+};
+
+} // namespace movieconv
+
+#endif

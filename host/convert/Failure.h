@@ -1,0 +1,51 @@
+// What can go wrong with a conversion, in kinds that a front end can act on.
+#ifndef MOVIECONV_HOST_CONVERT_FAILURE_H
+#define MOVIECONV_HOST_CONVERT_FAILURE_H
+
+#include <exception>
+#include <string>
+#include <utility>
+
+namespace movieconv {
+
+/// Who can do something about it.
+enum class Category {
+    kInternal, ///< Nobody: no memory, or a fault of the program.
+    kRequest,  ///< What was asked for makes no sense or does not fit together.
+    kSource,   ///< The source cannot be read, or not to its end.
+    kOutput,   ///< The output cannot be written.
+    kNoSpace,  ///< The disk or the quota is full.
+};
+
+/// What a front end may want to add a word of its own to, such as the name of a switch.
+enum class Reason {
+    kOther,
+    kNoMemory,      ///< The text may be empty.
+    kNoFormat,      ///< The output's name tells no file format, and the request neither.
+    kExists,        ///< The output is there already, and the request does not let it be replaced.
+    kCodec,         ///< The file format or the codec cannot be written.
+    kBeginTooLate,  ///< The begin is not before the source's end.
+    kPlaylist,      ///< The source is a playlist, and the request does not allow that.
+    kUnknownLength, ///< The source tells no length, and the request neither.
+};
+
+/// A failure that ends a conversion or keeps it from beginning: what, where and what to do.
+class Failure : public std::exception {
+public:
+    Failure(Category category, std::string text, Reason reason = Reason::kOther) noexcept
+        : category_(category), reason_(reason), text_(std::move(text)) {}
+
+    const char* what() const noexcept override { return text_.c_str(); }
+    const std::string& Text() const { return text_; } ///< A sentence without a full stop.
+    Category Kind() const { return category_; }
+    Reason Why() const { return reason_; }
+
+private:
+    Category category_;
+    Reason reason_;
+    std::string text_;
+};
+
+} // namespace movieconv
+
+#endif

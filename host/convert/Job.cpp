@@ -1,0 +1,146 @@
+#include "host/convert/Job.h"
+
+#include "host/convert/Course.h"
+#include "host/convert/EncodePlan.h"
+#include "host/convert/Outlet.h"
+#include "host/convert/OutputCheck.h"
+#include "host/convert/Sources.h"
+
+#include <condition_variable>
+#include <mutex>
+#include <new>
+#include <thread>
+#include <utility>
+
+namespace movieconv {
+namespace {
+
+Failure Unexpected(const std::exception& error) noexcept {
+    try {
+        return {Category::kInternal, error.what()};
+    } catch (const std::bad_alloc&) {
+        return {Category::kInternal, {}, Reason::kNoMemory};
+    }
+}
+
+} // namespace
+
+class Job::Impl {
+public:
+    Impl(Request request, Observer& observer, Loop loop)
+        : request_(std::move(request)), outlet_(observer, std::move(loop)), wishes_(request_.preview) {}
+    ~Impl() {
+        wishes_.stop = true;
+        wishes_.bell.Ring();
+        if (thread_.joinable())
+            thread_.join();
+    }
+
+    void Start() {
+        thread_ = std::thread([this] { Run(); });
+    }
+
+    Wishes& WhatIsWanted() { return wishes_; }
+
+    void Wait() {
+        std::unique_lock lock(mutex_);
+        end_.wait(lock, [this] { return ended_; });
+    }
+
+    const Verdict* Result() const {
+        const std::lock_guard lock(mutex_);
+        return ended_ ? &verdict_ : nullptr;
+    }
+
+private:
+    void Run() noexcept;
+    Verdict Convert();
+
+    const Request request_;
+    Outlet outlet_;
+    Wishes wishes_;
+    mutable std::mutex mutex_;
+    std::condition_variable end_;
+    bool ended_ = false;
+    Verdict verdict_;
+    std::thread thread_;
+};
+
+void Job::Impl::Run() noexcept {
+    Verdict verdict;
+    try {
+        verdict = Convert();
+    } catch (Failure& failure) {
+        verdict.failure = std::move(failure);
+    } catch (const std::bad_alloc&) {
+        verdict.failure = Failure(Category::kInternal, {}, Reason::kNoMemory);
+    } catch (const std::exception& error) {
+        verdict.failure = Unexpected(error);
+    }
+    {
+        const std::lock_guard lock(mutex_);
+        verdict_ = std::move(verdict);
+        ended_ = true;
+    }
+    end_.notify_all();
+    try {
+        outlet_.Ended(verdict_);
+    } catch (const std::bad_alloc&) { // Result tells it
+    }
+}
+
+Verdict Job::Impl::Convert() {
+    ChooseFormat(request_);
+    CheckOutput(request_);
+    Movie movie = OpenMovie(request_);
+    return Course(request_, movie, wishes_, outlet_).Run();
+}
+
+Job::Job(Request request, Observer& observer, Loop loop)
+    : impl_(std::make_unique<Impl>(std::move(request), observer, std::move(loop))) {}
+
+Job::~Job() = default;
+
+void Job::Start() {
+    impl_->Start();
+}
+
+void Job::Pause() {
+    impl_->WhatIsWanted().pause = true;
+    impl_->WhatIsWanted().bell.Ring();
+}
+
+void Job::Resume() {
+    impl_->WhatIsWanted().pause = false;
+    impl_->WhatIsWanted().bell.Ring();
+}
+
+void Job::Stop() {
+    impl_->WhatIsWanted().stop = true;
+    impl_->WhatIsWanted().bell.Ring();
+}
+
+void Job::RetryWrite() {
+    impl_->WhatIsWanted().retryWrite = true;
+    impl_->WhatIsWanted().bell.Ring();
+}
+
+void Job::GiveUpWrite() {
+    impl_->WhatIsWanted().giveUpWrite = true;
+    impl_->WhatIsWanted().bell.Ring();
+}
+
+void Job::ShowPictures(std::optional<std::chrono::milliseconds> interval) {
+    impl_->WhatIsWanted().pictures.SetInterval(interval);
+    impl_->WhatIsWanted().bell.Ring();
+}
+
+void Job::Wait() {
+    impl_->Wait();
+}
+
+const Verdict* Job::Result() const {
+    return impl_->Result();
+}
+
+} // namespace movieconv

@@ -1,0 +1,62 @@
+// One conversion under control, on a thread of its own.
+#ifndef MOVIECONV_HOST_CONVERT_JOB_H
+#define MOVIECONV_HOST_CONVERT_JOB_H
+
+#include "host/convert/Observer.h"
+#include "host/convert/Request.h"
+
+#include <chrono>
+#include <functional>
+#include <memory>
+#include <optional>
+
+namespace movieconv {
+
+/// Runs a function soon on the thread that the observer chose, in the order of the calls. Called on any
+/// thread. May throw std::bad_alloc: the news is lost, and the conversion ends for want of memory.
+using Loop = std::function<void(std::function<void()>)>;
+
+/// Converts one movie, once. A process may have any number of them. All functions may be called on any
+/// thread and return at once, but for Wait and the destructor.
+class Job {
+public:
+    /// `observer` hears the news by means of `loop`; without one on the conversion's own thread, where it
+    /// must return soon and must not wait for the job.
+    Job(Request request, Observer& observer, Loop loop = {});
+    Job(const Job&) = delete;
+    Job& operator=(const Job&) = delete;
+
+    /// Stops and waits for the end. No news comes afterwards. On the observer's thread.
+    ~Job();
+
+    /// Begins, once. Throws std::system_error when there is no thread for it.
+    void Start();
+
+    void Pause();
+    void Resume();
+
+    /// Ends the conversion: what was converted so far becomes a complete file, and the outcome is kStopped.
+    void Stop();
+
+    /// While it waits for room on a full disk: try the write again now; or give up, and the file fails.
+    void RetryWrite();
+    void GiveUpWrite();
+
+    /// Changes Request::preview.
+    void ShowPictures(std::optional<std::chrono::milliseconds> interval);
+
+    /// Waits until the conversion has ended. The last news may still wait in the loop.
+    void Wait();
+
+    /// How it ended; null before. Stays valid as long as the job, and is there even when no memory was left
+    /// to tell the observer.
+    const Verdict* Result() const;
+
+private:
+    class Impl;
+    const std::unique_ptr<Impl> impl_;
+};
+
+} // namespace movieconv
+
+#endif

@@ -1,0 +1,112 @@
+// The news of a conversion.
+#ifndef MOVIECONV_HOST_CONVERT_OBSERVER_H
+#define MOVIECONV_HOST_CONVERT_OBSERVER_H
+
+#include "host/convert/Failure.h"
+
+#include <cstdint>
+#include <memory>
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace movieconv {
+
+enum class Phase {
+    kConverting,
+    kPaused,
+    kFinishing, ///< The rest is encoded, the index written, the file synced.
+    kWaitingForRoom
+};
+
+struct Start {
+    std::string input;
+    std::string output;
+    double length;      ///< Seconds to convert.
+    bool lengthIsKnown; ///< False when it is a guess.
+};
+
+struct Progress {
+    Phase phase = Phase::kConverting;
+    bool phaseChanged = false; ///< Since the last report.
+    double position = 0;       ///< Seconds of the source converted.
+    double length = 0;
+    std::optional<double> percent; ///< Below 100; nothing when the length is a guess.
+    std::optional<double> speed;   ///< Seconds of source a second of work.
+    std::optional<double> left;    ///< Seconds of work for the rest.
+    int64_t bytes = 0;             ///< In the output so far, all clips.
+    double worked = 0;             ///< Seconds, pauses left out.
+    double finished = 0;           ///< Of the finishing phase, 0 to 1.
+    int clip = 0;                  ///< Number of the open clip from 1; 0 without splitting.
+};
+
+struct OpenedFile {
+    int number; ///< From 1.
+    std::string path;
+    std::string temporaryPath; ///< Where the data is until the file is complete.
+};
+
+struct ClosedFile {
+    int number;
+    std::string path;
+    double videoSeconds; ///< In the file; 0 without such a stream.
+    double audioSeconds;
+    int64_t bytes;
+};
+
+struct Warning {
+    enum class Kind {
+        kSmallRoom,    ///< The output will probably not find enough room.
+        kWaitsForRoom, ///< The disk is full; the conversion goes on when there is room, or ends by Stop.
+        kSource,       ///< Something was wrong with the source and has been put right or skipped.
+    };
+    Kind kind;
+    std::string text; ///< A sentence without a full stop.
+};
+
+/// A picture for display: blue, green, red and 255 for each pixel, without gaps, top row first.
+struct ShownPicture {
+    int width = 0;
+    int height = 0;
+    std::vector<uint8_t> bgra;
+};
+
+enum class Outcome {
+    kDone,    ///< All was converted and stands in files under their names.
+    kStopped, ///< By Job::Stop: what was converted until then stands in files under their names.
+    kFailed,
+};
+
+struct Verdict {
+    Outcome outcome = Outcome::kFailed;
+    std::optional<Failure> failure; ///< Of a failed one.
+    double position = 0;            ///< Seconds of the source converted.
+    double worked = 0;              ///< Seconds, pauses left out.
+    int64_t bytes = 0;              ///< Of the complete files.
+    int files = 0;                  ///< Complete ones.
+};
+
+/// Hears what happens in a conversion, always on the thread that it chose; see Job. Started comes once at
+/// most, first; Ended once, last. A request that is refused only ends. The defaults ignore the news.
+class Observer {
+public:
+    Observer() = default;
+    Observer(const Observer&) = delete;
+    Observer& operator=(const Observer&) = delete;
+    virtual ~Observer() = default;
+
+    virtual void Started(const Start&) {}
+    /// At least twice a second, but in a pause, and whenever the phase changes.
+    virtual void Progressed(const Progress&) {}
+    /// Also for an output that is not split. A file into which nothing is converted is removed without news.
+    virtual void Opened(const OpenedFile&) {}
+    /// The file is complete, on the disk, under its name.
+    virtual void Closed(const ClosedFile&) {}
+    virtual void Warned(const Warning&) {}
+    virtual void Showed(const std::shared_ptr<const ShownPicture>&) {}
+    virtual void Ended(const Verdict&) = 0;
+};
+
+} // namespace movieconv
+
+#endif

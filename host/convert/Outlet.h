@@ -1,0 +1,63 @@
+// Brings the news of a conversion to its observer's thread.
+#ifndef MOVIECONV_HOST_CONVERT_OUTLET_H
+#define MOVIECONV_HOST_CONVERT_OUTLET_H
+
+#include "host/convert/Job.h"
+#include "host/convert/Observer.h"
+
+#include <atomic>
+#include <memory>
+#include <utility>
+
+namespace movieconv {
+
+/// Hears news on one thread and hands it on by a Loop. What still waits in the loop when this object is
+/// destroyed, on the observer's thread, is dropped.
+class Outlet final : public Observer {
+public:
+    Outlet(Observer& observer, Loop loop)
+        : observer_(std::make_shared<std::atomic<Observer*>>(&observer)), loop_(std::move(loop)) {}
+    ~Outlet() override { *observer_ = nullptr; }
+
+    void Started(const Start& news) override {
+        Post([news](Observer& observer) { observer.Started(news); });
+    }
+    void Progressed(const Progress& news) override {
+        Post([news](Observer& observer) { observer.Progressed(news); });
+    }
+    void Opened(const OpenedFile& news) override {
+        Post([news](Observer& observer) { observer.Opened(news); });
+    }
+    void Closed(const ClosedFile& news) override {
+        Post([news](Observer& observer) { observer.Closed(news); });
+    }
+    void Warned(const Warning& news) override {
+        Post([news](Observer& observer) { observer.Warned(news); });
+    }
+    void Showed(const std::shared_ptr<const ShownPicture>& news) override {
+        Post([news](Observer& observer) { observer.Showed(news); });
+    }
+    void Ended(const Verdict& news) override {
+        Post([news](Observer& observer) { observer.Ended(news); });
+    }
+
+private:
+    template <class Tell>
+    void Post(Tell tell) {
+        const auto run = [observer = observer_, tell = std::move(tell)] {
+            if (Observer* present = *observer)
+                tell(*present);
+        };
+        if (loop_)
+            loop_(run);
+        else
+            run();
+    }
+
+    const std::shared_ptr<std::atomic<Observer*>> observer_;
+    const Loop loop_;
+};
+
+} // namespace movieconv
+
+#endif

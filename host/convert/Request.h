@@ -1,0 +1,62 @@
+// What a conversion is to do, in plain values.
+#ifndef MOVIECONV_HOST_CONVERT_REQUEST_H
+#define MOVIECONV_HOST_CONVERT_REQUEST_H
+
+#include <chrono>
+#include <cstdint>
+#include <optional>
+#include <string>
+
+namespace movieconv {
+
+/// What to do when the disk is full: the file fails, or the conversion waits until there is room.
+enum class OnFull { kStop, kWait };
+
+/// How pictures of another shape fill the output's: distorted, or with black borders.
+enum class Fit { kStretch, kBorders };
+
+struct Size {
+    int32_t width;
+    int32_t height;
+};
+
+/// Names are bytes as the system has them. What is not given is left to the engine's defaults and the source.
+struct Request {
+    std::string input;
+    std::string output;
+
+    std::optional<uint32_t>
+        format; ///< Four-character code; see Formats.h. By default the output's name tells.
+    std::optional<uint32_t> videoCodec; ///< Likewise; by default the format's usual one.
+    std::optional<uint32_t> audioCodec;
+    std::optional<Size> size;
+    Fit fit = Fit::kBorders;
+    std::optional<double> frameRate;     ///< Pictures per second, up to 200.
+    std::optional<int32_t> videoRate;    ///< Bits per second.
+    std::optional<int32_t> videoMaxRate; ///< Makes videoRate a target.
+    std::optional<int32_t> audioRate;
+    std::optional<int32_t> audioMaxRate;
+    std::optional<int32_t> channels;
+    std::optional<int32_t> sampleRate; ///< Samples per second and channel.
+    bool noVideo = false;
+    bool noAudio = false;
+    bool playlists = false; ///< The input may be a playlist, which names movies in its folder and below.
+
+    double begin = 0;             ///< Seconds.
+    std::optional<double> length; ///< Seconds, at least 0.001; by default all the rest.
+    std::optional<double> split;  ///< Seconds of each clip, 0.1 to 2000000; by default one file.
+
+    bool overwrite = false; ///< Whether a file that exists may be replaced.
+    OnFull onFull = OnFull::kStop;
+    bool keepPartial = true; ///< Whether the temporary file of a conversion that failed stays; it plays.
+
+    int encoderThreads = 0; ///< Of the picture encoder; 0 leaves it to the writer.
+    bool bitExact = false;  ///< Nothing in the file tells time, date or library version.
+
+    /// The shortest time between two pictures for display; nothing: none. The last picture is shown always.
+    std::optional<std::chrono::milliseconds> preview;
+};
+
+} // namespace movieconv
+
+#endif

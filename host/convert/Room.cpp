@@ -1,0 +1,36 @@
+#include "host/convert/Room.h"
+
+#include "host/convert/EncodePlan.h"
+#include "host/convert/Engine.h"
+#include "host/convert/Failure.h"
+#include "host/convert/Sources.h"
+#include "text/Path.h"
+
+#include <fmt/format.h>
+#include <sys/statvfs.h>
+
+namespace movieconv {
+
+int64_t FreeBytes(const std::string& folder) {
+    struct statvfs status {};
+    if (statvfs(folder.c_str(), &status) != 0 || status.f_blocks == 0)
+        return -1;
+    return static_cast<int64_t>(status.f_bavail) * static_cast<int64_t>(status.f_frsize);
+}
+
+Room EstimateRoom(const Request& request) {
+    ChooseFormat(request);
+    Movie movie = OpenMovie(request);
+    if (movie.Info().certainty == Certainty::kGuessed && !request.length) {
+        throw Failure(Category::kRequest, fmt::format("\"{}\" does not tell how long it is", request.input),
+                      Reason::kUnknownLength);
+    }
+    const double length = LengthToConvert(request, movie.Info());
+    const Engine engine = MakeEngine(request, movie);
+    EncodeParam param{};
+    MCGetEncodeParam(engine.get(), &param);
+    const std::string folder = text::FolderOf(request.output);
+    return {length, MCGetEstimateDiskSpaceEx(&param, length), folder, FreeBytes(folder)};
+}
+
+} // namespace movieconv

@@ -1,0 +1,34 @@
+#include "host/convert/Sources.h"
+
+#include "host/convert/Failure.h"
+
+namespace movieconv {
+namespace {
+
+SourceChoice ChoiceOf(const Request& request) {
+    return {.pictures = !request.noVideo, .sound = !request.noAudio, .playlists = request.playlists};
+}
+
+/// What `open` gives, with its errors as failures.
+template <class Open>
+auto Opened(Open open) {
+    try {
+        return open();
+    } catch (const PlaylistError& error) {
+        throw Failure(Category::kSource, error.what(), Reason::kPlaylist);
+    } catch (const SourceError& error) {
+        throw Failure(Category::kSource, error.what());
+    }
+}
+
+} // namespace
+
+Movie OpenMovie(const Request& request) {
+    return Opened([&] { return Movie(request.input, ChoiceOf(request)); });
+}
+
+SourceInfo LookAtSource(const Request& request) {
+    return Opened([&] { return Source(request.input, ChoiceOf(request)).Info(); });
+}
+
+} // namespace movieconv

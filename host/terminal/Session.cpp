@@ -1,0 +1,96 @@
+#include "host/terminal/Session.h"
+
+#include <chrono>
+#include <functional>
+#include <string>
+#include <utility>
+
+namespace movieconv {
+namespace {
+
+constexpr std::chrono::milliseconds kTick{500};
+
+} // namespace
+
+Session::Session(const Options& options, const StandardStreams& streams, MainLoop& loop,
+                 ControlInput& control)
+    : options_(options),
+      loop_(loop),
+      control_(control),
+      reporter_(MakeReporter(options, streams)),
+      job_(options.request, *this, [&loop](std::function<void()> work) { loop.Post(std::move(work)); }) {}
+
+ExitCode Session::Run() {
+    job_.Start();
+    while (!code_) {
+        const bool quiet = !loop_.RunNext(kTick);
+        control_.FollowTerminal();
+        if (const Verdict* verdict = job_.Result(); quiet && !code_ && verdict != nullptr)
+            Ended(*verdict); // there was no memory to tell it
+    }
+    return *code_;
+}
+
+void Session::Started(const Start& news) {
+    started_ = true;
+    if (options_.preview)
+        preview_.emplace(*options_.preview, options_.request.overwrite);
+    reporter_->Started(news);
+    control_.Arm(options_.progress == ProgressStyle::kBar && !options_.quiet,
+                 [this](Command command) { Obey(command); });
+}
+
+void Session::Progressed(const Progress& news) {
+    reporter_->Progressed(news);
+}
+
+void Session::Opened(const OpenedFile& news) {
+    control_.NoteFile(news.temporaryPath);
+    reporter_->Opened(news);
+}
+
+void Session::Closed(const ClosedFile& news) {
+    control_.NoteFile({});
+    reporter_->Closed(news);
+}
+
+void Session::Warned(const Warning& news) {
+    reporter_->Warned(news);
+}
+
+void Session::Showed(const std::shared_ptr<const ShownPicture>& news) {
+    if (preview_)
+        preview_->Offer(news);
+}
+
+void Session::Ended(const Verdict& news) {
+    if (!started_ && news.failure)
+        throw *news.failure;
+    if (preview_) {
+        if (const std::string failure = preview_->Finish(); !failure.empty())
+            reporter_->Warn(failure);
+    }
+    reporter_->Ended(news);
+    code_ = CodeOf(news);
+}
+
+void Session::Obey(Command command) {
+    switch (command) {
+    case Command::kStop:
+        job_.Stop();
+        break;
+    case Command::kPauseKey:
+        paused_ = !paused_;
+        if (paused_)
+            job_.Pause();
+        else
+            job_.Resume();
+        break;
+    case Command::kSuspend:
+        reporter_->LeaveLine();
+        control_.Suspend();
+        break;
+    }
+}
+
+} // namespace movieconv
