@@ -86,6 +86,20 @@ inline Frame NewFrame() {
     return frame ? std::move(frame) : throw std::bad_alloc();
 }
 
+/// An AVIOContext with a buffer of its own. Throws std::bad_alloc.
+inline Io NewIo(int bufferSize, bool forWriting, void* opaque, int (*read)(void*, uint8_t*, int),
+                int (*write)(void*, uint8_t*, int), int64_t (*seek)(void*, int64_t, int)) {
+    auto* buffer = static_cast<unsigned char*>(av_malloc(static_cast<size_t>(bufferSize)));
+    if (buffer == nullptr)
+        throw std::bad_alloc();
+    Io io(avio_alloc_context(buffer, bufferSize, forWriting ? 1 : 0, opaque, read, write, seek));
+    if (!io) {
+        av_free(buffer);
+        throw std::bad_alloc();
+    }
+    return io;
+}
+
 /// Options for an open call; what is left in it afterwards was not recognised.
 class Options {
 public:

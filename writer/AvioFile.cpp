@@ -3,7 +3,6 @@
 #include <algorithm>
 #include <cerrno>
 #include <cstdio>
-#include <new>
 #include <utility>
 
 namespace writer {
@@ -15,20 +14,13 @@ constexpr int kBufferSize = 128 * 1024;
 
 AvioFile::AvioFile(std::shared_ptr<ByteFile> file, Mode mode, FullDiskHandler onFull)
     : file_(std::move(file)), onFull_(std::move(onFull)) {
-    auto* buffer = static_cast<unsigned char*>(av_malloc(kBufferSize));
-    if (buffer == nullptr)
-        throw std::bad_alloc();
-    io_.reset(avio_alloc_context(
-        buffer, kBufferSize, mode == Mode::kWrite ? 1 : 0, this,
+    io_ = av::NewIo(
+        kBufferSize, mode == Mode::kWrite, this,
         [](void* self, uint8_t* data, int size) { return static_cast<AvioFile*>(self)->Read(data, size); },
         [](void* self, uint8_t* data, int size) { return static_cast<AvioFile*>(self)->Write(data, size); },
         [](void* self, int64_t offset, int whence) {
             return static_cast<AvioFile*>(self)->Seek(offset, whence);
-        }));
-    if (!io_) {
-        av_free(buffer);
-        throw std::bad_alloc();
-    }
+        });
     size_ = std::max<int64_t>(0, file_->Seek(0, SEEK_END));
     file_->Seek(0, SEEK_SET);
     // Multiplexers mark a point at which one may flush after every packet; a system call for each would be

@@ -3,7 +3,7 @@
 #define MOVIECONV_WRITER_AVIOFILE_H
 
 #include "ffmpeg/AvHandles.h"
-#include "writer/OutputFile.h"
+#include "writer/FileSystem.h"
 
 #include <atomic>
 #include <cstdint>

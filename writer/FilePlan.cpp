@@ -20,7 +20,7 @@ constexpr int kDefaultAudioBitrate = 128'000;
 constexpr double kDefaultFrameRate = 25.0;
 constexpr double kLeastFrameRate = 0.0001; // what is below is no rate, as in the engine
 constexpr double kMostFrameRate = 1000.0;
-constexpr unsigned kMostThreads = 8;
+constexpr long kMostThreads = 16;
 
 /// The first value that is above 0, else `last`.
 template <typename Number>
@@ -36,12 +36,11 @@ bool SameRate(double one, double other) {
     return std::abs(one - other) <= 0.001 * other;
 }
 
-int ChooseThreads(const VideoCodec& codec, const WriterOptions& options) {
+int ChooseThreads(const PictureCodec& codec, const WriterOptions& options) {
     if (options.nEncoderThreads > 0)
         return options.nEncoderThreads;
-    return codec.parallel
-               ? static_cast<int>(std::clamp(std::thread::hardware_concurrency(), 1U, kMostThreads))
-               : 1;
+    const long wanted = std::lround(codec.threads * std::thread::hardware_concurrency());
+    return static_cast<int>(std::clamp(wanted, 1L, kMostThreads));
 }
 
 /// An ISO/IEC 23091-2 code as FFmpeg's enumerations, which have the same values; 2 is "not stated" in all of
@@ -55,9 +54,9 @@ std::string FormatText(const EncodeParam& param) {
     return "\"" + CodeText(param.fccFileFormat) + "\"";
 }
 
-VideoSettings MakeVideoSettings(const EncodeParam& param, const VideoFormat& source, const VideoCodec& codec,
-                                const WriterOptions& options) {
-    VideoSettings settings{};
+PictureSettings MakePictureSettings(const EncodeParam& param, const VideoFormat& source,
+                                    const PictureCodec& codec, const WriterOptions& options) {
+    PictureSettings settings{};
     settings.width = FirstPositive(param.nWidth, source.nWidth, 0);
     settings.height = FirstPositive(param.nHeight, source.nHeight, 0);
     if (param.nWidth < 0 || param.nHeight < 0 ||
@@ -77,14 +76,14 @@ VideoSettings MakeVideoSettings(const EncodeParam& param, const VideoFormat& sou
     return settings;
 }
 
-VideoPlan MakeVideoPlan(const EncodeParam& param, const VideoFormat& source, const Container& container,
-                        const WriterOptions& options) {
-    VideoPlan plan{};
-    plan.codec = FindVideoCodec(container, param.fccVideo);
+PicturePlan MakePicturePlan(const EncodeParam& param, const VideoFormat& source, const Container& container,
+                            const WriterOptions& options) {
+    PicturePlan plan{};
+    plan.codec = FindPictureCodec(container, param.fccVideo);
     if (plan.codec == nullptr)
         throw WriterFailure(kWriterErrorCodec, "The format " + FormatText(param) + " cannot carry video \"" +
                                                    CodeText(param.fccVideo) + "\".");
-    plan.settings = MakeVideoSettings(param, source, *plan.codec, options);
+    plan.settings = MakePictureSettings(param, source, *plan.codec, options);
     plan.sourceAspect = {options.nSampleAspectNum, options.nSampleAspectDen};
     if (plan.sourceAspect.num <= 0 || plan.sourceAspect.den <= 0)
         plan.sourceAspect = {1, 1};
@@ -96,17 +95,16 @@ VideoPlan MakeVideoPlan(const EncodeParam& param, const VideoFormat& source, con
         plan.settings.sampleAspect =
             FitPicture(source.nWidth, source.nHeight, plan.sourceAspect, width, height, plan.stretch)
                 .sampleAspect;
-    plan.picture = {width, height, 0, 0, AV_PIX_FMT_YUV420P, plan.sourceFullRange};
+    plan.picture = {width, height, 0, 0, plan.codec->format, plan.sourceFullRange};
     if (plan.codec->evenSize) {
         plan.picture.padWidth = width % 2;
         plan.picture.padHeight = height % 2;
         plan.settings.width += plan.picture.padWidth;
         plan.settings.height += plan.picture.padHeight;
     }
-    if (plan.codec->fullRange) {
-        plan.picture.format = AV_PIX_FMT_YUVJ420P;
+    if (plan.codec->format == AV_PIX_FMT_YUVJ420P)
         plan.picture.fullRange = true;
-    }
+    plan.settings.format = plan.picture.format;
     plan.settings.fullRange = plan.picture.fullRange;
     plan.settings.inOrder = container.kind == ContainerKind::kSteadyRate;
     plan.clock = MakePictureClock(plan.settings.rate, container.kind == ContainerKind::kSteadyRate);
@@ -118,9 +116,9 @@ VideoPlan MakeVideoPlan(const EncodeParam& param, const VideoFormat& source, con
     return plan;
 }
 
-AudioPlan MakeAudioPlan(const EncodeParam& param, const AudioFormat& source, const Container& container) {
-    AudioPlan plan{};
-    plan.codec = FindAudioCodec(container, param.fccAudio);
+SoundPlan MakeSoundPlan(const EncodeParam& param, const AudioFormat& source, const Container& container) {
+    SoundPlan plan{};
+    plan.codec = FindSoundCodec(container, param.fccAudio);
     if (plan.codec == nullptr)
         throw WriterFailure(kWriterErrorCodec, "The format " + FormatText(param) + " cannot carry audio \"" +
                                                    CodeText(param.fccAudio) + "\".");
@@ -129,7 +127,10 @@ AudioPlan MakeAudioPlan(const EncodeParam& param, const AudioFormat& source, con
     plan.settings.bitsPerSample = FirstPositive(param.nBitsPerSample, source.nBitsPerSample, 16);
     plan.settings.bitrate = FirstPositive(param.nAudioBitrate, kDefaultAudioBitrate, 0);
     plan.settings.maxBitrate = param.nAudioRateMode != 0 ? std::max(0, param.nAudioMaxBitrate) : 0;
-    plan.settings.flashRates = NeedsFlashRates(container, *plan.codec);
+    const Carriage& carriage = FindCarriage(container, plan.codec->code);
+    plan.settings.sampleRates = carriage.sampleRates;
+    plan.fillsStart = container.kind == ContainerKind::kSteadyRate;
+    plan.neverEmpty = carriage.describedByPacket;
     if (plan.settings.sampleRate <= 0 || plan.settings.channels <= 0)
         throw WriterFailure(kWriterErrorArgument, "Sound of " + std::to_string(plan.settings.sampleRate) +
                                                       " Hz with " + std::to_string(plan.settings.channels) +
@@ -146,10 +147,10 @@ FilePlan MakeFilePlan(const EncodeParam& param, const VideoFormat* video, const 
     if (plan.container == nullptr)
         throw WriterFailure(kWriterErrorFormat, "The file format " + FormatText(param) + " is not known.");
     if (video != nullptr && param.bNoVideo == 0 && plan.container->video.front() != 0)
-        plan.video = MakeVideoPlan(param, *video, *plan.container, options);
+        plan.pictures = MakePicturePlan(param, *video, *plan.container, options);
     if (audio != nullptr && param.bNoAudio == 0 && plan.container->audio.front() != 0)
-        plan.audio = MakeAudioPlan(param, *audio, *plan.container);
-    if (!plan.video && !plan.audio)
+        plan.sound = MakeSoundPlan(param, *audio, *plan.container);
+    if (!plan.pictures && !plan.sound)
         throw WriterFailure(kWriterErrorArgument,
                             "There is nothing to write into a file of the format " + FormatText(param) + ".");
     plan.bitExact = options.bBitExact != 0;

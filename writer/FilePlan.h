@@ -5,10 +5,11 @@
 
 #include "media/EncodeParam.h"
 #include "media/MediaRecords.h"
-#include "writer/Encoders.h"
 #include "writer/FormatTable.h"
+#include "writer/PictureEncoder.h"
 #include "writer/PicturePacer.h"
 #include "writer/PictureScaler.h"
+#include "writer/SoundEncoder.h"
 #include "writer/WriterStatus.h"
 
 #include <cstdint>
@@ -16,9 +17,9 @@
 
 namespace writer {
 
-struct VideoPlan {
-    const VideoCodec* codec;
-    VideoSettings settings;
+struct PicturePlan {
+    const PictureCodec* codec;
+    PictureSettings settings;
     PictureScaler::Output picture;
     AVRational sourceAspect; ///< Shape of the source's pixels.
     bool sourceFullRange;
@@ -28,16 +29,22 @@ struct VideoPlan {
     int64_t pictureLength; ///< Usual length of a source picture in 100 ns units.
 };
 
-struct AudioPlan {
-    const AudioCodec* codec;
-    AudioSettings settings;
+struct SoundPlan {
+    const SoundCodec* codec;
+    SoundSettings settings;
+    bool fillsStart; ///< Sound that begins late is preceded by silence: every stream begins at 0.
+    /// Where there is no sound at all, one silent sample takes its place: its packet describes the stream.
+    bool neverEmpty;
 };
 
 struct FilePlan {
     const Container* container;
-    std::optional<VideoPlan> video;
-    std::optional<AudioPlan> audio;
+    std::optional<PicturePlan> pictures;
+    std::optional<SoundPlan> sound;
     bool bitExact;
+
+    /// Whether the file grows in fragments and gets one index when it is finished.
+    bool Fragmented() const { return container->kind == ContainerKind::kFragmented; }
 };
 
 /// Throws WriterFailure when the parameters make no sense or do not fit together. `video` and `audio` may be

@@ -1,6 +1,7 @@
 #include "writer/FormatTable.h"
 
 #include "media/FourCC.h"
+#include "writer/WriterStatus.h"
 
 extern "C" {
 #include <libavformat/avformat.h>
@@ -31,48 +32,67 @@ constexpr uint32_t kVorbis = FourCC("VORB");
 constexpr uint32_t kPcm = FourCC("PCM ");
 
 // clang-format off
-constexpr std::array kVideoCodecs{
-    VideoCodec{kXvid,  AV_CODEC_ID_MPEG4,      "mpeg4",      false, false, false},
-    VideoCodec{kH264,  AV_CODEC_ID_H264,       "libx264",    true,  false, true},
-    VideoCodec{kHevc,  AV_CODEC_ID_HEVC,       "libx265",    true,  false, false},
-    VideoCodec{kMjpg,  AV_CODEC_ID_MJPEG,      "mjpeg",      false, true,  false},
-    VideoCodec{kVp8,   AV_CODEC_ID_VP8,        "libvpx",     false, false, true},
-    VideoCodec{kVp9,   AV_CODEC_ID_VP9,        "libvpx-vp9", false, false, true},
-    VideoCodec{kMpeg2, AV_CODEC_ID_MPEG2VIDEO, "mpeg2video", false, false, false},
-    VideoCodec{kFlv1,  AV_CODEC_ID_FLV1,       "flv",        false, false, false},
+constexpr AVPixelFormat kPlanar = AV_PIX_FMT_YUV420P;
+constexpr AVPixelFormat kPlanarFull = AV_PIX_FMT_YUVJ420P;
+constexpr const char* kVpxOptions = "deadline=good,cpu-used=4";
+constexpr std::array kPictureCodecs{
+    PictureCodec{kXvid,  AV_CODEC_ID_MPEG4,      "mpeg4",      kPlanar,     false, 0.0, nullptr},
+    PictureCodec{kH264,  AV_CODEC_ID_H264,       "libx264",    kPlanar,     true,  1.5, "preset=fast"},
+    // Frames encoded side by side can wait for each other for ever at the end; rows still are.
+    PictureCodec{kHevc,  AV_CODEC_ID_HEVC,       "libx265",    kPlanar,     true,  0.0,
+                 "preset=fast,x265-params=log-level=none:frame-threads=1"},
+    PictureCodec{kMjpg,  AV_CODEC_ID_MJPEG,      "mjpeg",      kPlanarFull, false, 0.0, nullptr},
+    PictureCodec{kVp8,   AV_CODEC_ID_VP8,        "libvpx",     kPlanar,     false, 1.0, kVpxOptions},
+    PictureCodec{kVp9,   AV_CODEC_ID_VP9,        "libvpx-vp9", kPlanar,     false, 1.0, kVpxOptions},
+    PictureCodec{kMpeg2, AV_CODEC_ID_MPEG2VIDEO, "mpeg2video", kPlanar,     false, 0.0, nullptr},
+    PictureCodec{kFlv1,  AV_CODEC_ID_FLV1,       "flv",        kPlanar,     false, 0.0, nullptr},
 };
 
 // The limits of AAC are the format's (6144 bits for a frame of 1024 samples), those of the others their encoders'.
-constexpr std::array kAudioCodecs{
-    AudioCodec{kAac,    AV_CODEC_ID_AAC,       "aac",        8, 0.5, 6.0},
-    AudioCodec{kMp3,    AV_CODEC_ID_MP3,       "libmp3lame", 2, 0.5, 8.0},
-    AudioCodec{kAc3,    AV_CODEC_ID_AC3,       "ac3",        6, 0.5, 14.0},
-    AudioCodec{kFlac,   AV_CODEC_ID_FLAC,      "flac",       8, 0.0, 0.0},
-    AudioCodec{kOpus,   AV_CODEC_ID_OPUS,      "libopus",    8, 0.2, 5.3},
-    AudioCodec{kVorbis, AV_CODEC_ID_VORBIS,    "libvorbis",  8, 1.0, 3.8, 48000},
-    AudioCodec{kPcm,    AV_CODEC_ID_PCM_S16LE, "pcm_s16le",  8, 0.0, 0.0},
+constexpr std::array kSoundCodecs{
+    SoundCodec{kAac,    AV_CODEC_ID_AAC,       "aac",        8, 0.5, 6.0},
+    SoundCodec{kMp3,    AV_CODEC_ID_MP3,       "libmp3lame", 2, 0.5, 8.0},
+    SoundCodec{kAc3,    AV_CODEC_ID_AC3,       "ac3",        6, 0.5, 14.0},
+    SoundCodec{kFlac,   AV_CODEC_ID_FLAC,      "flac",       8, 0.0, 0.0},
+    SoundCodec{kOpus,   AV_CODEC_ID_OPUS,      "libopus",    8, 0.2, 5.3},
+    SoundCodec{kVorbis, AV_CODEC_ID_VORBIS,    "libvorbis",  8, 1.0, 3.8, 48000},
+    SoundCodec{kPcm,    AV_CODEC_ID_PCM_S16LE, "pcm_s16le",  8, 0.0, 0.0},
 };
 
 using enum ContainerKind;
+constexpr const char* kClusters = "cluster_time_limit=1000"; // what is lost at most when a file is cut off
 constexpr std::array kContainers{
-    Container{FourCC("MP4 "), "MP4 (MPEG-4 Part 14)", "mp4,m4v", "mp4", kFragmented,
+    Container{FourCC("MP4 "), "MP4 (MPEG-4 Part 14)", "mp4,m4v", "mp4", kFragmented, nullptr,
               {kXvid, kH264, kHevc, kMjpg, kVp9, kMpeg2}, {kAac, kMp3, kAc3, kOpus, kVorbis}},
-    Container{FourCC("MOV "), "QuickTime", "mov,qt", "mov", kFragmented,
+    Container{FourCC("MOV "), "QuickTime", "mov,qt", "mov", kFragmented, nullptr,
               {kXvid, kH264, kHevc, kMjpg, kMpeg2}, {kAac, kMp3, kAc3, kPcm}},
-    Container{FourCC("MKV "), "Matroska", "mkv", "matroska", kStreamed,
+    Container{FourCC("MKV "), "Matroska", "mkv", "matroska", kStreamed, kClusters,
               {kXvid, kH264, kHevc, kMjpg, kVp8, kVp9, kMpeg2, kFlv1},
               {kAac, kMp3, kAc3, kFlac, kOpus, kVorbis, kPcm}},
-    Container{FourCC("AVI "), "AVI (Audio Video Interleaved)", "avi,divx", "avi", kSteadyRate,
+    Container{FourCC("AVI "), "AVI (Audio Video Interleaved)", "avi,divx", "avi", kSteadyRate, nullptr,
               {kXvid, kH264, kMjpg, kVp8, kMpeg2, kFlv1}, {kMp3, kAac, kAc3, kPcm}},
-    Container{FourCC("WEBM"), "WebM", "webm", "webm", kStreamed, {kVp8, kVp9}, {kVorbis, kOpus}},
-    Container{FourCC("FLV "), "Flash Video", "flv", "flv", kStreamed, {kH264, kFlv1}, {kAac, kMp3}},
-    Container{FourCC("TS  "), "MPEG transport stream", "ts,m2ts,mts", "mpegts", kStreamed,
+    Container{FourCC("WEBM"), "WebM", "webm", "webm", kStreamed, kClusters, {kVp8, kVp9}, {kVorbis, kOpus}},
+    Container{FourCC("FLV "), "Flash Video", "flv", "flv", kStreamed, nullptr, {kH264, kFlv1}, {kAac, kMp3}},
+    Container{FourCC("TS  "), "MPEG transport stream", "ts,m2ts,mts", "mpegts", kStreamed, nullptr,
               {kH264, kHevc, kXvid, kMpeg2}, {kAac, kMp3, kAc3, kOpus}},
-    Container{FourCC("M4A "), "MPEG-4 audio", "m4a,m4b", "ipod", kFragmented, {}, {kAac, kAc3}},
-    Container{FourCC("MP3 "), "MP3", "mp3", "mp3", kStreamed, {}, {kMp3}},
-    Container{FourCC("WAV "), "WAV (RIFF wave)", "wav", "wav", kSteadyRate, {}, {kPcm, kMp3, kAc3}},
-    Container{FourCC("FLAC"), "FLAC", "flac", "flac", kStreamed, {}, {kFlac}},
-    Container{FourCC("OGG "), "Ogg", "ogg,oga,opus", "ogg", kStreamed, {}, {kVorbis, kOpus, kFlac}},
+    Container{FourCC("M4A "), "MPEG-4 audio", "m4a,m4b", "ipod", kFragmented, nullptr, {}, {kAac, kAc3}},
+    Container{FourCC("MP3 "), "MP3", "mp3", "mp3", kStreamed, nullptr, {}, {kMp3}},
+    Container{FourCC("WAV "), "WAV (RIFF wave)", "wav", "wav", kSteadyRate, "rf64=auto", {}, {kPcm, kMp3, kAc3}},
+    Container{FourCC("FLAC"), "FLAC", "flac", "flac", kStreamed, nullptr, {}, {kFlac}},
+    Container{FourCC("OGG "), "Ogg", "ogg,oga,opus", "ogg", kStreamed, nullptr, {}, {kVorbis, kOpus, kFlac}},
+};
+
+constexpr std::array kFlashRates{44100, 22050, 11025, 0};
+constexpr std::array kCarriages{
+    Carriage{FourCC("MOV "), kXvid, kXvid},
+    Carriage{FourCC("AVI "), kXvid, kXvid},
+    // Players of one large vendor take HEVC only under this tag.
+    Carriage{FourCC("MP4 "), kHevc, FourCC("hvc1")},
+    Carriage{FourCC("MOV "), kHevc, FourCC("hvc1")},
+    Carriage{FourCC("MP4 "), kAc3, 0, true},
+    Carriage{FourCC("MOV "), kAc3, 0, true},
+    Carriage{FourCC("M4A "), kAc3, 0, true},
+    Carriage{FourCC("FLV "), kMp3, 0, false, kFlashRates.data()},
 };
 
 /// Other names under which a codec is asked for, in capitals.
@@ -133,8 +153,8 @@ FileFormatInfo Describe(const Container& container) {
     info.fccFormat = container.code;
     std::strncpy(info.szName, container.name, sizeof info.szName - 1);
     std::strncpy(info.szExtensions, container.extensions, sizeof info.szExtensions - 1);
-    info.bHasVideo = CopyEncodable(kVideoCodecs, container.video, info.fccVideoCodecs) ? 1 : 0;
-    info.bHasAudio = CopyEncodable(kAudioCodecs, container.audio, info.fccAudioCodecs) ? 1 : 0;
+    info.bHasVideo = CopyEncodable(kPictureCodecs, container.video, info.fccVideoCodecs) ? 1 : 0;
+    info.bHasAudio = CopyEncodable(kSoundCodecs, container.audio, info.fccAudioCodecs) ? 1 : 0;
     return info;
 }
 
@@ -144,19 +164,19 @@ const Container* FindContainer(uint32_t code) {
     return code == 0 ? nullptr : FindByCode(kContainers, Canonical(code));
 }
 
-const VideoCodec* FindVideoCodec(const Container& container, uint32_t code) {
-    return FindFitting(kVideoCodecs, container.video, code);
+const PictureCodec* FindPictureCodec(const Container& container, uint32_t code) {
+    return FindFitting(kPictureCodecs, container.video, code);
 }
 
-const AudioCodec* FindAudioCodec(const Container& container, uint32_t code) {
-    return FindFitting(kAudioCodecs, container.audio, code);
+const SoundCodec* FindSoundCodec(const Container& container, uint32_t code) {
+    return FindFitting(kSoundCodecs, container.audio, code);
 }
 
-const AVCodec* FindEncoder(const VideoCodec& codec) {
+const AVCodec* FindEncoder(const PictureCodec& codec) {
     return avcodec_find_encoder_by_name(codec.encoder);
 }
 
-const AVCodec* FindEncoder(const AudioCodec& codec, int bitsPerSample) {
+const AVCodec* FindEncoder(const SoundCodec& codec, int bitsPerSample) {
     if (codec.code != kPcm)
         return avcodec_find_encoder_by_name(codec.encoder);
     switch (bitsPerSample) {
@@ -171,18 +191,18 @@ const AVCodec* FindEncoder(const AudioCodec& codec, int bitsPerSample) {
     }
 }
 
-bool NeedsFlashRates(const Container& container, const AudioCodec& codec) {
-    return container.code == FourCC("FLV ") && codec.code == kMp3;
+const Carriage& FindCarriage(const Container& container, uint32_t codec) {
+    static constexpr Carriage kUsual;
+    const auto found = std::find_if(kCarriages.begin(), kCarriages.end(), [&](const Carriage& carriage) {
+        return carriage.container == container.code && carriage.codec == codec;
+    });
+    return found == kCarriages.end() ? kUsual : *found;
 }
 
-uint32_t StreamTag(const Container& container, AVCodecID id) {
-    const bool mov = container.code == FourCC("MOV ");
-    if (id == AV_CODEC_ID_MPEG4 && (mov || container.code == FourCC("AVI ")))
-        return kXvid;
-    // Players of one large vendor take HEVC only under this tag.
-    if (id == AV_CODEC_ID_HEVC && container.kind == ContainerKind::kFragmented)
-        return FourCC("hvc1");
-    return 0;
+uint32_t FormatTraits(uint32_t code) {
+    const Container* container = FindContainer(code);
+    return container != nullptr && container->kind == ContainerKind::kSteadyRate ? kWriterFormatSteadyRate
+                                                                                 : 0;
 }
 
 std::string CodeText(uint32_t code) {

@@ -15,18 +15,22 @@ extern "C" {
 namespace writer {
 
 /// A codec for pictures.
-struct VideoCodec {
+struct PictureCodec {
     uint32_t code;
     AVCodecID id;
     const char* encoder;
-    bool evenSize;  ///< Odd widths and heights are not accepted.
-    bool fullRange; ///< Luma covers 0 to 255.
-    bool parallel;  ///< Expensive enough for threads of its own; the output depends on their number, never on
-                    ///< timing.
+    AVPixelFormat format; ///< Of the pictures that the encoder gets; a "J" format: luma covers 0 to 255.
+    bool evenSize;        ///< Odd widths and heights are not accepted.
+    /// Threads for each processor where the caller leaves the choice: 0 for one thread. The output depends on
+    /// their number, never on timing.
+    double threads;
+    /// Speed and quality of an encoder that leaves the choice to the caller, its own options as
+    /// "name=value,...", and that it has to be told how far key frames may lie apart; null: neither.
+    const char* options;
 };
 
 /// A codec for sound.
-struct AudioCodec {
+struct SoundCodec {
     uint32_t code;
     AVCodecID id; ///< For PCM the 16-bit one; the sample size chooses.
     const char* encoder;
@@ -34,6 +38,16 @@ struct AudioCodec {
     double minBits;        ///< Least bits per sample and channel; 0: no limit.
     double maxBits;        ///< Most bits per sample and channel; 0: no bit rate at all.
     int maxSampleRate = 0; ///< 0: as the encoder tells itself.
+};
+
+/// What is not as usual when a container carries a codec.
+struct Carriage {
+    uint32_t container = 0;
+    uint32_t codec = 0;
+    uint32_t tag = 0; ///< The stream's tag where the multiplexer's own choice is not the usual one; else 0.
+    /// The file's description of the stream is made from its first packet, so that there has to be one.
+    bool describedByPacket = false;
+    const int* sampleRates = nullptr; ///< The only ones, ended by 0; null: as the codec has them.
 };
 
 /// How a file can be kept playable while it grows, and what a container cannot express.
@@ -50,6 +64,7 @@ struct Container {
     const char* extensions;
     const char* muxer;
     ContainerKind kind;
+    const char* options;            ///< The multiplexer's own, as "name=value,...".
     std::array<uint32_t, 10> video; ///< Codes of the codecs that fit, the default first, then zeros.
     std::array<uint32_t, 10> audio;
 };
@@ -59,18 +74,18 @@ const Container* FindContainer(uint32_t code);
 
 /// The codec of that code, its usual other names understood; null when there is none or `container` cannot
 /// carry it.
-const VideoCodec* FindVideoCodec(const Container& container, uint32_t code);
-const AudioCodec* FindAudioCodec(const Container& container, uint32_t code);
+const PictureCodec* FindPictureCodec(const Container& container, uint32_t code);
+const SoundCodec* FindSoundCodec(const Container& container, uint32_t code);
 
 /// This FFmpeg build's encoder; null when it has none. `bitsPerSample` chooses among those for PCM.
-const AVCodec* FindEncoder(const VideoCodec& codec);
-const AVCodec* FindEncoder(const AudioCodec& codec, int bitsPerSample);
+const AVCodec* FindEncoder(const PictureCodec& codec);
+const AVCodec* FindEncoder(const SoundCodec& codec, int bitsPerSample);
 
-/// Whether the container takes the codec at 11025, 22050 and 44100 Hz only.
-bool NeedsFlashRates(const Container& container, const AudioCodec& codec);
+/// How the container carries the codec.
+const Carriage& FindCarriage(const Container& container, uint32_t codec);
 
-/// The tag that the container gives the codec when the multiplexer's own choice is not the usual one; else 0.
-uint32_t StreamTag(const Container& container, AVCodecID id);
+/// kWriterFormat... of the format; 0 when the code is not in the table.
+uint32_t FormatTraits(uint32_t code);
 
 /// The four characters of a code, for messages.
 std::string CodeText(uint32_t code);

@@ -134,13 +134,4 @@ void CheckIndex(const std::shared_ptr<ByteFile>& file, const Muxer& written) {
     }
 }
 
-int64_t CutToWholeFragments(ByteFile& part) {
-    const int64_t end = part.Seek(0, SEEK_END);
-    const int64_t whole = WholeSize(part, end);
-    if (whole == end)
-        return end;
-    const int64_t result = part.Truncate(whole);
-    return result < 0 ? result : whole;
-}
-
 } // namespace writer

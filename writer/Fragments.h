@@ -20,10 +20,6 @@ void JoinFragments(const std::shared_ptr<ByteFile>& part, const Muxer& written, 
 /// leaves out without a word what it has no memory for.
 void CheckIndex(const std::shared_ptr<ByteFile>& file, const Muxer& written);
 
-/// Cuts a file off behind its last whole fragment, after a failure in the middle of one. Returns the new
-/// size, or a negated errno.
-int64_t CutToWholeFragments(ByteFile& part);
-
 } // namespace writer
 
 #endif

@@ -14,11 +14,11 @@
 
 #include "media/EncodeParam.h"
 #include "media/MediaRecords.h"
-#include "writer/AvioFile.h"
 #include "writer/FilePlan.h"
 #include "writer/FileRecord.h"
+#include "writer/FileSystem.h"
 #include "writer/Muxer.h"
-#include "writer/OutputFile.h"
+#include "writer/PartFile.h"
 #include "writer/PictureStage.h"
 #include "writer/SoundStage.h"
 #include "writer/StampNormaliser.h"
@@ -51,34 +51,22 @@ public:
     bool Close();
 
 private:
-    void OpenPart();
     void OpenStages();
     void StartPictures();
     void StartSoundIfKnown();
     bool AddSound(const AudioFrame& frame, const PcmFormat& format);
     bool PushSound();
-    void Write(AVPacket& packet, int stream);
     void Fail(const std::exception_ptr& error) noexcept;
-    WriterFailure Explain(const std::exception_ptr& error) const noexcept;
     void CancelStages();
     void DrainStages();
     int Conclude();
     bool Empty() const;
-    void FinishPart();
-    void JoinPart();
-    void JoinInto(const std::string& path, const std::shared_ptr<ByteFile>& file);
-    void Publish(const std::string& path, ByteFile& file);
-    void RemovePart();
-    void CloseFailed();
-    void Progress(double share);
 
     const FilePlan plan_;
     const std::string target_;
     const std::shared_ptr<FileRecord> record_;
     FileSystem& files_;
-    std::string partPath_;
-    std::unique_ptr<AvioFile> part_;
-    std::unique_ptr<Muxer> muxer_;
+    PartFile part_;
     int pictureStream_ = -1;
     int soundStream_ = -1;
     StampNormaliser stamps_;
@@ -86,7 +74,6 @@ private:
         waiting_; ///< Sound whose place is not known yet, or too short a stretch to hand on.
     bool soundStarted_ = false;
     std::optional<int64_t> firstPicture_; ///< Its time in the file.
-    double toldShare_ = 0;
     std::unique_ptr<PictureStage> pictures_;
     std::unique_ptr<SoundStage> sound_;
 };

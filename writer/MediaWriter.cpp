@@ -104,6 +104,10 @@ int MWCloseMediaFile(void* file, ProgressCallback /*callback*/, void* /*context*
     return Guarded(0, [&] { return owned && owned->Close() ? 1 : 0; });
 }
 
+uint32_t MWGetFormatTraits(uint32_t format) {
+    return Guarded<uint32_t>(0, [&] { return writer::FormatTraits(format); });
+}
+
 uint32_t MWRegisterOptions(const WriterOptions* options) {
     return Guarded<uint32_t>(0, [&] {
         const auto known = writer::ReadOptions(options);
@@ -116,10 +120,10 @@ uint32_t MWFindCodec(uint32_t format, uint32_t code, int forSound) {
     if (container == nullptr)
         return 0;
     if (forSound != 0) {
-        const writer::AudioCodec* codec = writer::FindAudioCodec(*container, code);
+        const writer::SoundCodec* codec = writer::FindSoundCodec(*container, code);
         return codec != nullptr && writer::FindEncoder(*codec, 16) != nullptr ? codec->code : 0;
     }
-    const writer::VideoCodec* codec = writer::FindVideoCodec(*container, code);
+    const writer::PictureCodec* codec = writer::FindPictureCodec(*container, code);
     return codec != nullptr && writer::FindEncoder(*codec) != nullptr ? codec->code : 0;
 }
 

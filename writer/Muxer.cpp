@@ -9,6 +9,7 @@ extern "C" {
 }
 
 #include <algorithm>
+#include <iterator>
 #include <new>
 #include <string>
 #include <utility>
@@ -21,14 +22,10 @@ namespace {
 constexpr int64_t kFragmentLength = 1'000'000;
 
 /// By how many microseconds one stream may run ahead of another before it is written without it; longer until
-/// each has begun.
+/// each has begun, as long as what waits is not too large: an encoder may hold many pictures of a low rate.
 constexpr int64_t kMostApart = 10'000'000;
 constexpr int64_t kMostApartAtFirst = 600'000'000;
-
-bool Has(const AVFormatContext& output, AVCodecID id) {
-    return std::any_of(output.streams, output.streams + output.nb_streams,
-                       [id](const AVStream* stream) { return stream->codecpar->codec_id == id; });
-}
+constexpr int64_t kMostBytesAtFirst = 32 << 20;
 
 bool HasPictures(const AVFormatContext& output) {
     return std::any_of(output.streams, output.streams + output.nb_streams, [](const AVStream* stream) {
@@ -46,7 +43,7 @@ void SetOption(AVFormatContext& output, const char* name, const std::string& val
     av::CheckMemory(av_opt_set(&output, name, value.c_str(), AV_OPT_SEARCH_CHILDREN));
 }
 
-void SetFragments(AVFormatContext& output) {
+void SetFragments(AVFormatContext& output, bool describedByPacket) {
     // Times are written as they are, from the first fragment on.
     std::string flags = "empty_moov+default_base_moof+frag_discont";
     SetOption(output, "use_editlist", "0");
@@ -57,8 +54,7 @@ void SetFragments(AVFormatContext& output) {
     } else {
         SetOption(output, "frag_duration", std::to_string(kFragmentLength));
     }
-    // The description of this codec is only known from its first packet.
-    if (Has(output, AV_CODEC_ID_AC3))
+    if (describedByPacket)
         flags += "+delay_moov";
     SetOption(output, "movflags", flags);
 }
@@ -66,7 +62,7 @@ void SetFragments(AVFormatContext& output) {
 } // namespace
 
 Muxer::Muxer(const Container& container, AvioFile& file, bool fragmented, bool bitExact)
-    : container_(container), fragmented_(fragmented), packet_(av::NewPacket()) {
+    : container_(container), file_(file), fragmented_(fragmented), packet_(av::NewPacket()) {
     AVFormatContext* output = nullptr;
     const int error = avformat_alloc_output_context2(&output, nullptr, container.muxer, nullptr);
     output_.reset(output);
@@ -82,24 +78,34 @@ int Muxer::AddStream(const MuxedStream& stream) {
     if (made == nullptr)
         throw std::bad_alloc();
     Check(avcodec_parameters_copy(made->codecpar, stream.parameters), "does not take a stream");
-    made->codecpar->codec_tag = StreamTag(container_, made->codecpar->codec_id);
+    made->codecpar->codec_tag = stream.carriage->tag;
     made->time_base = stream.unit;
     made->avg_frame_rate = stream.rate;
     made->sample_aspect_ratio = stream.sampleAspect;
-    streams_.push_back({stream.unit, stream.runUp});
+    streams_.push_back({stream.unit, stream.runUp, stream.carriage});
     return made->index;
 }
 
 void Muxer::WriteHeader() {
-    // Not handed over with the header: of options that there is no memory for, that tells nothing.
-    if (fragmented_)
-        SetFragments(*output_);
-    else if (container_.kind == ContainerKind::kSteadyRate)
-        SetOption(*output_, "avoid_negative_ts",
-                  "disabled"); // Moving pictures by less than one would lose one.
+    SetOptions();
     Check(avformat_write_header(output_.get(), nullptr), "refuses its header");
+    NoteWhole();
     if (fragmented_)
         SetDelays();
+}
+
+/// One by one: avformat_write_header ignores it when it has no memory for one.
+void Muxer::SetOptions() {
+    if (container_.options != nullptr)
+        av::CheckMemory(av_set_options_string(output_->priv_data, container_.options, "=", ","));
+    if (fragmented_) {
+        SetFragments(*output_, std::any_of(streams_.begin(), streams_.end(), [](const State& stream) {
+            return stream.carriage->describedByPacket;
+        }));
+    } else if (container_.kind == ContainerKind::kSteadyRate) {
+        SetOption(*output_, "avoid_negative_ts",
+                  "disabled"); // Moving pictures by less than one would lose one.
+    }
 }
 
 /// The right to use the multiplexer, which may write to the file for long.
@@ -144,12 +150,55 @@ void Muxer::Write(AVPacket& packet, int stream) {
     }
     state.lastDts = packet_->dts;
     packet_->stream_index = stream;
-    // What begins before the first packet of the file is refused by some: an encoder may hold many pictures.
-    const bool allBegun =
-        std::all_of(streams_.begin(), streams_.end(), [](const State& each) { return each.begun; });
-    output_->max_interleave_delta = allBegun ? kMostApart : kMostApartAtFirst;
+    const int64_t time = av_rescale_q(packet_->dts, out->time_base, AV_TIME_BASE_Q);
+    output_->max_interleave_delta = MostApart(packet_->size);
     Check(av_interleaved_write_frame(output_.get(), packet_.get()), "refuses a packet");
     ++state.packets;
+    NoteWhole();
+    FlushNowAndThen(time);
+}
+
+/// What begins before the first packet of the file is refused by some.
+int64_t Muxer::MostApart(int packetSize) {
+    const bool allBegun =
+        std::all_of(streams_.begin(), streams_.end(), [](const State& each) { return each.begun; });
+    if (allBegun)
+        return kMostApart;
+    bytesAtFirst_ += packetSize;
+    return bytesAtFirst_ > kMostBytesAtFirst ? kMostApart : kMostApartAtFirst;
+}
+
+/// Between two packets the multiplexers have written nothing by halves: what they hold back is not in the
+/// file's buffer yet.
+void Muxer::NoteWhole() {
+    const int64_t position = avio_tell(output_->pb);
+    if (wholes_.empty() || position > wholes_.back())
+        wholes_.push_back(position);
+    while (wholes_.size() > 1 && wholes_[1] <= file_.Size())
+        wholes_.pop_front();
+}
+
+/// So that no more is lost when the program is killed than where fragments are written.
+void Muxer::FlushNowAndThen(int64_t time) {
+    if (flushed_ != INT64_MIN && time - flushed_ < kFragmentLength)
+        return;
+    flushed_ = time;
+    avio_flush(output_->pb); // a failure is told by the next packet, or by the end
+}
+
+int64_t Muxer::WholeSize(int64_t size) const {
+    const Turn turn(*this);
+    if (finished_ && file_.Error() == 0)
+        return size;
+    const auto beyond = std::upper_bound(wholes_.begin(), wholes_.end(), size);
+    return beyond == wholes_.begin() ? 0 : *std::prev(beyond);
+}
+
+bool Muxer::Describable() const {
+    const Turn turn(*this);
+    return std::all_of(streams_.begin(), streams_.end(), [](const State& stream) {
+        return !stream.carriage->describedByPacket || stream.packets > 0;
+    });
 }
 
 void Muxer::WriteTrailer() {
@@ -157,6 +206,7 @@ void Muxer::WriteTrailer() {
     if (std::exchange(ended_, true))
         return;
     Check(av_write_trailer(output_.get()), "cannot be finished");
+    finished_ = true;
 }
 
 Muxer::Written Muxer::Stream(int stream) const {
@@ -165,10 +215,11 @@ Muxer::Written Muxer::Stream(int stream) const {
     const AVStream* out = output_->streams[stream];
     const int64_t length = state.endPts - state.firstPts - out->codecpar->initial_padding;
     const int64_t runUp = av_rescale_q(state.runUp, state.unit, out->time_base);
-    return {{out->codecpar, out->time_base, out->avg_frame_rate, out->sample_aspect_ratio, runUp},
-            state.delay,
-            state.packets,
-            static_cast<double>(std::max<int64_t>(0, length)) * av_q2d(state.unit)};
+    return {
+        {out->codecpar, out->time_base, out->avg_frame_rate, out->sample_aspect_ratio, runUp, state.carriage},
+        state.delay,
+        state.packets,
+        static_cast<double>(std::max<int64_t>(0, length)) * av_q2d(state.unit)};
 }
 
 bool Muxer::Empty() const {

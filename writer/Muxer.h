@@ -8,6 +8,7 @@
 
 #include <condition_variable>
 #include <cstdint>
+#include <deque>
 #include <mutex>
 #include <vector>
 
@@ -20,6 +21,7 @@ struct MuxedStream {
     AVRational rate;                     ///< Pictures per second; 0/1 for sound.
     AVRational sampleAspect;             ///< Shape of the pixels; 0/1 for sound.
     int64_t runUp;                       ///< How far below 0 times can begin, in the unit.
+    const Carriage* carriage;            ///< How the container carries its codec.
 };
 
 /// Streams are added, the header is written, then packets come from any thread, then the end.
@@ -50,6 +52,13 @@ public:
     };
     Written Stream(int stream) const;
 
+    /// How much of the file, of which `size` bytes are on the disk, is whole: what follows is the beginning
+    /// of something (a packet, a cluster, a fragment) whose end never came.
+    int64_t WholeSize(int64_t size) const;
+
+    /// Whether the end can be written: there has been a packet of each stream that is described by one.
+    bool Describable() const;
+
     /// Whether no packet was taken yet.
     bool Empty() const;
 
@@ -59,6 +68,7 @@ private:
     struct State {
         AVRational unit{0, 1};
         int64_t runUp = 0;
+        const Carriage* carriage = nullptr;
         int64_t delay = 0; ///< In the file's unit.
         int64_t lastDts = AV_NOPTS_VALUE;
         int64_t packets = 0;
@@ -71,9 +81,14 @@ private:
 
     static void NoteTimes(State& state, const AVPacket& packet);
     void Check(int result, const char* what) const;
+    void SetOptions();
     void SetDelays();
+    int64_t MostApart(int packetSize);
+    void NoteWhole();
+    void FlushNowAndThen(int64_t time);
 
     const Container& container_;
+    AvioFile& file_;
     const bool fragmented_;
     av::Output output_;
     av::Packet packet_;
@@ -82,7 +97,11 @@ private:
     mutable std::mutex mutex_;
     mutable std::condition_variable changed_;
     std::vector<State> streams_;
-    bool ended_ = false;
+    bool ended_ = false;          ///< The end was asked for,
+    bool finished_ = false;       ///< and is written.
+    int64_t bytesAtFirst_ = 0;    ///< Of the packets that came before each stream had begun.
+    std::deque<int64_t> wholes_;  ///< Sizes at which the file was whole; the first is on the disk.
+    int64_t flushed_ = INT64_MIN; ///< Time of the packet after which was flushed, in microseconds.
 };
 
 } // namespace writer

@@ -10,7 +10,7 @@ extern "C" {
 namespace writer {
 namespace {
 
-constexpr size_t kMostPictures = 1; // whatever it weighs
+constexpr size_t kMostPictures = 1; // they are large
 
 av::Frame CopyPicture(FramePool& pool, const VideoImage& image) {
     av::Frame frame = pool.Get(AV_PIX_FMT_YUV420P, image.nWidth, image.nHeight);
@@ -27,49 +27,33 @@ av::Frame CopyPicture(FramePool& pool, const VideoImage& image) {
 
 } // namespace
 
-PictureStage::PictureStage(const VideoPlan& plan, EncoderFlags flags)
+PictureStage::PictureStage(const PicturePlan& plan, EncoderFlags flags)
     : plan_(plan),
       encoder_(*plan.codec, plan.settings, flags, plan.clock.ticksPerPicture),
       pacer_(plan.clock, plan.keepStamps),
       scaler_(plan.picture, plan.sourceAspect, plan.stretch, plan.sourceFullRange),
-      queue_(kMostPictures, 0,
-             {L"MediaWriter::The conversion waits for the picture encoder",
-              L"MediaWriter::The picture encoder waits for the conversion"}) {}
-
-PictureStage::~PictureStage() {
-    Cancel();
-    Join();
-}
+      thread_(kMostPictures, 0,
+              {L"MediaWriter::The conversion waits for the picture encoder",
+               L"MediaWriter::The picture encoder waits for the conversion"}) {}
 
 void PictureStage::Start(PacketTaker take, Shown shown, StageFailure failed) {
     take_ = std::move(take);
     shown_ = std::move(shown);
-    thread_ = std::thread([this, failed = std::move(failed)] {
-        try {
-            Run();
-        } catch (...) {
-            failed(std::current_exception());
-        }
-    });
+    thread_.Start([this] { Run(); }, std::move(failed));
 }
 
 bool PictureStage::Push(const VideoImage& image, int64_t time) {
-    if (!queue_.WaitForRoom())
+    if (!thread_.Queue().WaitForRoom())
         return false;
     av::Frame frame = CopyPicture(pool_, image);
     frame->pts = time;
-    return queue_.Push(std::move(frame));
-}
-
-void PictureStage::Join() {
-    if (thread_.joinable())
-        thread_.join();
+    return thread_.Queue().Push(std::move(frame));
 }
 
 void PictureStage::Run() {
     av::Frame open; // the picture whose showing is still open
     int64_t end = 0;
-    while (std::optional<av::Frame> frame = queue_.Pop()) {
+    while (std::optional<av::Frame> frame = thread_.Queue().Pop()) {
         const int64_t time = (*frame)->pts;
         end = time + plan_.pictureLength;
         const PicturePacer::Showing showing = pacer_.Add(time);

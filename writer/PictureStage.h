@@ -3,29 +3,24 @@
 #define MOVIECONV_WRITER_PICTURESTAGE_H
 
 #include "media/MediaRecords.h"
-#include "thread/BoundedQueue.h"
-#include "writer/Encoders.h"
 #include "writer/FilePlan.h"
+#include "writer/PictureEncoder.h"
 #include "writer/PicturePacer.h"
 #include "writer/PictureScaler.h"
+#include "writer/StageThread.h"
 
 #include <cstdint>
-#include <exception>
 #include <functional>
-#include <thread>
 
 namespace writer {
-
-/// Told of what ended a stage's thread early; called on that thread.
-using StageFailure = std::function<void(std::exception_ptr)>;
 
 class PictureStage {
 public:
     /// Opens the encoder; throws WriterFailure. `plan` is read during the life of the stage.
-    PictureStage(const VideoPlan& plan, EncoderFlags flags);
+    PictureStage(const PicturePlan& plan, EncoderFlags flags);
     PictureStage(const PictureStage&) = delete;
     PictureStage& operator=(const PictureStage&) = delete;
-    ~PictureStage();
+    ~PictureStage() = default;
 
     const AVCodecContext& Encoder() const { return encoder_.Context(); }
 
@@ -39,28 +34,22 @@ public:
     /// False when the stage has ended.
     bool Push(const VideoImage& image, int64_t time);
 
-    /// No more pictures will come.
-    void Finish() { queue_.Finish(); }
-
-    /// Ends the stage at once; what it holds is dropped.
-    void Cancel() { queue_.Close(); }
-
-    /// Waits for the thread.
-    void Join();
+    void Finish() { thread_.Finish(); }
+    void Cancel() { thread_.Cancel(); }
+    void Join() { thread_.Join(); }
 
 private:
     void Run();
     void Show(av::Frame picture, const PicturePacer::Showing& showing);
 
-    const VideoPlan& plan_;
-    VideoEncoder encoder_;
+    const PicturePlan& plan_;
+    PictureEncoder encoder_;
     PicturePacer pacer_;
     PictureScaler scaler_;
     FramePool pool_; ///< Used by Push only.
-    BoundedQueue<av::Frame> queue_;
     PacketTaker take_;
     Shown shown_;
-    std::thread thread_;
+    StageThread<av::Frame> thread_;
 };
 
 } // namespace writer

@@ -18,60 +18,43 @@ constexpr int64_t kSilenceAtOnce = 65536;
 
 } // namespace
 
-SoundStage::SoundStage(const AudioPlan& plan, EncoderFlags flags, bool fillsStart, bool neverEmpty)
-    : fillsStart_(fillsStart),
-      neverEmpty_(neverEmpty),
+SoundStage::SoundStage(const SoundPlan& plan, EncoderFlags flags)
+    : plan_(plan),
       encoder_(*plan.codec, plan.settings, flags),
       converter_(Encoder().sample_rate, Encoder().ch_layout, Encoder().sample_fmt),
-      queue_(kMostBlocks, kMostBytes,
-             {L"MediaWriter::The conversion waits for the sound encoder",
-              L"MediaWriter::The sound encoder waits for the conversion"}) {}
-
-SoundStage::~SoundStage() {
-    Cancel();
-    Join();
-}
+      thread_(kMostBlocks, kMostBytes,
+              {L"MediaWriter::The conversion waits for the sound encoder",
+               L"MediaWriter::The sound encoder waits for the conversion"}) {}
 
 void SoundStage::Start(int64_t start, PacketTaker take, Encoded encoded, StageFailure failed) {
     take_ = std::move(take);
     encoded_ = std::move(encoded);
-    thread_ = std::thread([this, start, failed = std::move(failed)] {
-        try {
-            Run(start);
-        } catch (...) {
-            failed(std::current_exception());
-        }
-    });
+    thread_.Start([this, start] { Run(start); }, std::move(failed));
 }
 
 bool SoundStage::Push(SoundBlock block) {
     const size_t size = block.data.size();
-    return queue_.Push(std::move(block), size);
-}
-
-void SoundStage::Join() {
-    if (thread_.joinable())
-        thread_.join();
+    return thread_.Queue().Push(std::move(block), size);
 }
 
 void SoundStage::Run(int64_t start) {
     int64_t shift = av_rescale(start, Encoder().sample_rate, kTicksPerSecond);
-    int64_t silence = fillsStart_ ? std::exchange(shift, 0) : 0;
+    int64_t silence = plan_.fillsStart ? std::exchange(shift, 0) : 0;
     const PacketTaker take = [this, shift](AVPacket& packet) {
         packet.pts += shift;
         packet.dts += shift;
         take_(packet);
     };
-    while (silence > 0 && !cancelled_) {
+    while (silence > 0 && !thread_.Cancelled()) {
         const int64_t part = std::min(silence, kSilenceAtOnce);
         converter_.PushSilence(part);
         EncodeAvailable(encoder_.FrameSize(), take);
         silence -= part;
     }
-    while (const std::optional<SoundBlock> block = queue_.Pop())
+    while (const std::optional<SoundBlock> block = thread_.Queue().Pop())
         Encode(*block, take);
     converter_.Finish();
-    if (neverEmpty_ && empty_ && converter_.Available() == 0)
+    if (plan_.neverEmpty && empty_ && converter_.Available() == 0)
         converter_.PushSilence(1);
     EncodeAvailable(1, take);
     encoder_.Finish(take);
@@ -80,7 +63,7 @@ void SoundStage::Run(int64_t start) {
 /// In pieces: a block of a low rate is far longer in the encoder's samples.
 void SoundStage::Encode(const SoundBlock& block, const PacketTaker& take) {
     const size_t pieceSize = converter_.PieceSize(block.format);
-    for (size_t done = 0; done < block.data.size() && !cancelled_; done += pieceSize) {
+    for (size_t done = 0; done < block.data.size() && !thread_.Cancelled(); done += pieceSize) {
         converter_.Push(block.format, block.data.data() + done,
                         std::min(pieceSize, block.data.size() - done));
         EncodeAvailable(encoder_.FrameSize(), take);

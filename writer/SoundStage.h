@@ -2,16 +2,13 @@
 #ifndef MOVIECONV_WRITER_SOUNDSTAGE_H
 #define MOVIECONV_WRITER_SOUNDSTAGE_H
 
-#include "thread/BoundedQueue.h"
-#include "writer/Encoders.h"
 #include "writer/FilePlan.h"
-#include "writer/PictureStage.h"
 #include "writer/SoundConverter.h"
+#include "writer/SoundEncoder.h"
+#include "writer/StageThread.h"
 
-#include <atomic>
 #include <cstdint>
 #include <functional>
-#include <thread>
 #include <vector>
 
 namespace writer {
@@ -24,13 +21,11 @@ struct SoundBlock {
 
 class SoundStage {
 public:
-    /// Opens the encoder; throws WriterFailure. `fillsStart`: sound that begins late is preceded by silence,
-    /// for containers in which every stream begins at 0. `neverEmpty`: where there is no sound at all, one
-    /// silent sample takes its place.
-    SoundStage(const AudioPlan& plan, EncoderFlags flags, bool fillsStart, bool neverEmpty);
+    /// Opens the encoder; throws WriterFailure. `plan` is read during the life of the stage.
+    SoundStage(const SoundPlan& plan, EncoderFlags flags);
     SoundStage(const SoundStage&) = delete;
     SoundStage& operator=(const SoundStage&) = delete;
-    ~SoundStage();
+    ~SoundStage() = default;
 
     const AVCodecContext& Encoder() const { return encoder_.Context(); }
 
@@ -43,33 +38,22 @@ public:
     /// Waits while the stage is full. False when the stage has ended.
     bool Push(SoundBlock block);
 
-    /// No more sound will come.
-    void Finish() { queue_.Finish(); }
-
-    /// Ends the stage at once; what it holds is dropped.
-    void Cancel() {
-        cancelled_ = true;
-        queue_.Close();
-    }
-
-    /// Waits for the thread.
-    void Join();
+    void Finish() { thread_.Finish(); }
+    void Cancel() { thread_.Cancel(); }
+    void Join() { thread_.Join(); }
 
 private:
     void Run(int64_t start);
     void Encode(const SoundBlock& block, const PacketTaker& take);
     void EncodeAvailable(int least, const PacketTaker& take);
 
-    const bool fillsStart_;
-    const bool neverEmpty_;
+    const SoundPlan& plan_;
     bool empty_ = true;
-    AudioEncoder encoder_;
+    SoundEncoder encoder_;
     SoundConverter converter_;
-    BoundedQueue<SoundBlock> queue_;
-    std::atomic<bool> cancelled_{false};
     PacketTaker take_;
     Encoded encoded_;
-    std::thread thread_;
+    StageThread<SoundBlock> thread_;
 };
 
 } // namespace writer

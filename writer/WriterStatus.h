@@ -135,7 +135,8 @@ typedef struct WriterOptions {
     int32_t nColorPrimaries;  ///< As in ISO/IEC 23091-2; 0 or 2: not stated.
     int32_t nColorTransfer;   ///< As in ISO/IEC 23091-2; 0 or 2: not stated.
     int32_t nColorMatrix;     ///< As in ISO/IEC 23091-2; 0 or 2: not stated.
-    /// Threads of the picture encoder; 0: one, or for H.264, HEVC, VP8 and VP9 one a processor, 8 at most.
+    /// Threads of the picture encoder; 0: one, for VP8 and VP9 one a processor, for H.264 one and a half, 16
+    /// at most. HEVC has threads of its own beside.
     /// The number may change the output, timing never does.
     int32_t nEncoderThreads;
     int32_t bBitExact;          ///< Nonzero: nothing in the file tells time, date or library version.
@@ -146,6 +147,15 @@ typedef struct WriterOptions {
     WriterFullDiskHandler pfnFullDisk; ///< Null: a full disk fails the file at once.
     void* pContext;                    ///< First argument of both.
 } WriterOptions;
+
+/// What distinguishes a file format beside what FileFormatInfo says.
+enum {
+    /// The file has one picture rate and knows no other times: what comes faster is left out.
+    kWriterFormatSteadyRate = 1
+};
+
+/// kWriterFormat... of the format with that code, together; 0 for one that is not in the table.
+uint32_t MWGetFormatTraits(uint32_t format);
 
 /// Registers a set with these options. Returns its number, which is never kWriterDefaultSet, or 0 when
 /// `options` is null, its size makes no sense, it has options that this version of the writer does not know,

@@ -2,7 +2,6 @@
 
 #include "host/convert/Failure.h"
 #include "host/convert/Formats.h"
-#include "media/FourCC.h"
 #include "writer/WriterStatus.h"
 
 #include <algorithm>
@@ -12,7 +11,6 @@ namespace movieconv {
 namespace {
 
 constexpr double kHighestFrameRate = 200; // of the output: from a source of more the engine makes 30
-constexpr uint32_t kSteadyRateFormat = FourCC("AVI "); // leaves out what comes faster than its one rate
 
 uint32_t FindCarried(uint32_t asked, const FileFormatInfo& format, bool forSound) {
     const uint32_t code = MWFindCodec(format.fccFormat, asked, forSound ? 1 : 0);
@@ -69,7 +67,7 @@ EncodeParam PlanEncoding(const EncodeParam& defaults, const FileFormatInfo& form
     param.bResize = request.fit == Fit::kStretch ? 1 : 0;
     if (request.frameRate) // no reference to the record's double, which lies on a 4-byte boundary
         param.dFrameRate = *request.frameRate;
-    else if (source.pictures && format.fccFormat == kSteadyRateFormat &&
+    else if (source.pictures && (MWGetFormatTraits(format.fccFormat) & kWriterFormatSteadyRate) != 0 &&
              source.pictures->frameRate <= kHighestFrameRate)
         param.dFrameRate = std::min(source.pictures->peakRate, kHighestFrameRate);
     param.nVideoBitrate = request.videoRate.value_or(param.nVideoBitrate);

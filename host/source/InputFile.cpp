@@ -23,21 +23,13 @@ InputFile::InputFile(const std::string& path)
     struct stat status {};
     const bool regular = fstat(file_.Number(), &status) == 0 && S_ISREG(status.st_mode);
     size_ = regular ? status.st_size : 0;
-    auto* buffer = static_cast<unsigned char*>(av_malloc(kBufferBytes));
     const auto read = [](void* self, uint8_t* data, int size) {
         return static_cast<const InputFile*>(self)->Read(data, size);
     };
     const auto seek = [](void* self, int64_t offset, int whence) {
         return static_cast<const InputFile*>(self)->Seek(offset, whence);
     };
-    if (buffer != nullptr) {
-        io_.reset(
-            avio_alloc_context(buffer, kBufferBytes, 0, this, read, nullptr, regular ? +seek : nullptr));
-    }
-    if (!io_) {
-        av_free(buffer);
-        throw std::bad_alloc();
-    }
+    io_ = av::NewIo(kBufferBytes, false, this, read, nullptr, regular ? +seek : nullptr);
 }
 
 InputFile::Descriptor::Descriptor(int number) : number_(number) {

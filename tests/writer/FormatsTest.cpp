@@ -64,7 +64,7 @@ TEST_P(Formats, AreReadBackComplete) {
     const writer::Container* container = writer::FindContainer(GetParam().format);
     EXPECT_TRUE(read.readable);
     EXPECT_EQ(read.audioStreams, 1);
-    EXPECT_EQ(read.audioCodec, writer::FindAudioCodec(*container, GetParam().audio)->id);
+    EXPECT_EQ(read.audioCodec, writer::FindSoundCodec(*container, GetParam().audio)->id);
     EXPECT_EQ(read.channels, 2);
     // The decoder may hear the run-up and the padding of the codec's frames, nothing else.
     const double heard = static_cast<double>(read.samples) / read.sampleRate;
@@ -72,7 +72,7 @@ TEST_P(Formats, AreReadBackComplete) {
     EXPECT_GE(heard, 1.2 - 0.0001);
     if (movie_.hasVideo) {
         EXPECT_EQ(read.videoStreams, 1);
-        EXPECT_EQ(read.videoCodec, writer::FindVideoCodec(*container, GetParam().video)->id);
+        EXPECT_EQ(read.videoCodec, writer::FindPictureCodec(*container, GetParam().video)->id);
         ASSERT_EQ(read.pictures.size(), 30U);
         const double start = read.pictures.front().time;
         for (size_t i = 0; i < read.pictures.size(); ++i)

@@ -10,7 +10,9 @@
 #include <filesystem>
 #include <memory>
 #include <string>
+#include <sys/stat.h>
 #include <thread>
+#include <unistd.h>
 #include <vector>
 
 namespace {
@@ -134,6 +136,33 @@ TEST(MediaWriter, KeepsAnExistingFileWhenAsked) {
     EXPECT_EQ(status.nSystemError, EEXIST);
     EXPECT_EQ(std::filesystem::file_size(path), 8U);
     EXPECT_EQ(ReadMovieFile(status.szTemporaryPath).pictures.size(), 50U);
+}
+
+TEST(MediaWriter, KeepsPermissionsAndOwnerOfWhatItReplaces) {
+    const Folder folder;
+    const std::string path = folder / "movie";
+    const mode_t mask = umask(022);
+    WriteFile(path, "old");
+    const bool isRoot = geteuid() == 0;
+    ASSERT_EQ(chmod(path.c_str(), 0660), 0);
+    ASSERT_EQ(chown(path.c_str(), isRoot ? 12345 : geteuid(), isRoot ? 23456 : getegid()), 0);
+    struct stat old {};
+    struct stat part {};
+    struct stat now {};
+    ASSERT_EQ(stat(path.c_str(), &old), 0);
+    void* file = TestMovie().Create(path);
+    ASSERT_EQ(stat((path + ".part").c_str(), &part), 0);
+    EXPECT_EQ(part.st_mode, old.st_mode) << "others can read it while it grows";
+    TestMovie().WriteAll(file);
+    EXPECT_EQ(MWCloseMediaFile(file, nullptr, nullptr), 1);
+    ASSERT_EQ(stat(path.c_str(), &now), 0);
+    EXPECT_EQ(now.st_mode, old.st_mode);
+    EXPECT_EQ(now.st_uid, old.st_uid);
+    EXPECT_EQ(now.st_gid, old.st_gid);
+    EXPECT_TRUE(TestMovie().Write(folder / "new"));
+    ASSERT_EQ(stat((folder / "new").c_str(), &now), 0);
+    EXPECT_EQ(now.st_mode & 0777, 0644U);
+    umask(mask);
 }
 
 TEST(MediaWriter, WritesThroughALinkAndLeavesIt) {

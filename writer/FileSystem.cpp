@@ -1,4 +1,4 @@
-#include "writer/OutputFile.h"
+#include "writer/FileSystem.h"
 
 #include <algorithm>
 #include <array>
@@ -37,10 +37,15 @@ public:
     }
 
     /// 0, or an errno value.
-    int Create(const std::string& path) {
+    int Create(const std::string& path, const std::string& like) {
+        struct stat model {};
+        const bool modelled = stat(like.c_str(), &model) == 0 && S_ISREG(model.st_mode);
+        const mode_t mode = modelled ? model.st_mode & 0777 : 0666;
         const int64_t result =
-            Retry([&] { return open(path.c_str(), O_RDWR | O_CREAT | O_EXCL | O_CLOEXEC, 0666); });
+            Retry([&] { return open(path.c_str(), O_RDWR | O_CREAT | O_EXCL | O_CLOEXEC, mode); });
         descriptor_ = static_cast<int>(result);
+        if (result >= 0 && modelled)
+            Resemble(model);
         return result < 0 ? static_cast<int>(-result) : 0;
     }
 
@@ -61,14 +66,25 @@ public:
     }
 
 private:
+    /// Who may not give a file away still gives it the group where he is in it. What a group may do is not
+    /// granted to another one.
+    void Resemble(const struct stat& model) const {
+        struct stat own {};
+        if (fchown(descriptor_, model.st_uid, model.st_gid) != 0 &&
+            fchown(descriptor_, static_cast<uid_t>(-1), model.st_gid) != 0)
+            errno = 0;
+        const bool sameGroup = fstat(descriptor_, &own) == 0 && own.st_gid == model.st_gid;
+        fchmod(descriptor_, model.st_mode & (sameGroup ? 0777 : 0707));
+    }
+
     int descriptor_ = -1;
 };
 
 class PosixFiles final : public FileSystem {
 public:
-    std::unique_ptr<ByteFile> Create(const std::string& path, int& error) override {
+    std::unique_ptr<ByteFile> Create(const std::string& path, const std::string& like, int& error) override {
         auto file = std::make_unique<PosixFile>(); // first: without memory nothing must be left on the disk
-        error = file->Create(path);
+        error = file->Create(path, like);
         return error != 0 ? nullptr : std::move(file);
     }
 
@@ -149,7 +165,7 @@ std::unique_ptr<ByteFile> CreateBeside(FileSystem& files, const std::string& tar
     for (int number = 1; number <= kMostNumbers; ++number) {
         const std::string tail = number == 1 ? suffix : suffix + std::to_string(number);
         path = target.substr(0, nameAt) + CutName(target.substr(nameAt), longest - tail.size()) + tail;
-        std::unique_ptr<ByteFile> file = files.Create(path, error);
+        std::unique_ptr<ByteFile> file = files.Create(path, target, error);
         if (file || error != EEXIST)
             return file;
     }

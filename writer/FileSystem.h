@@ -1,7 +1,7 @@
 // The files that the writer makes, and the few things it asks of a file system. Names are opened here, so
 // that they are never taken for a protocol, and tests can put a failing disk behind the same interface.
-#ifndef MOVIECONV_WRITER_OUTPUTFILE_H
-#define MOVIECONV_WRITER_OUTPUTFILE_H
+#ifndef MOVIECONV_WRITER_FILESYSTEM_H
+#define MOVIECONV_WRITER_FILESYSTEM_H
 
 #include <cstdint>
 #include <memory>
@@ -37,8 +37,10 @@ public:
     virtual ~FileSystem() = default;
 
     /// Creates a file for writing and reading; EEXIST when there is one of that name. Null with `error` set
-    /// on failure.
-    virtual std::unique_ptr<ByteFile> Create(const std::string& path, int& error) = 0;
+    /// on failure. It has the permissions of the file named `like`, where that exists, and its owner and
+    /// group as far as that is permitted.
+    virtual std::unique_ptr<ByteFile> Create(const std::string& path, const std::string& like,
+                                             int& error) = 0;
     /// Gives `from` the name `to`, in one step; EEXIST when `to` exists and must not be replaced.
     virtual int Rename(const std::string& from, const std::string& to, bool replace) = 0;
     virtual int Remove(const std::string& path) = 0;
@@ -58,8 +60,9 @@ int CheckTarget(const std::string& path);
 /// Where the data of `path` really goes: links are followed, so that they stay links. Throws std::bad_alloc.
 std::string ResolveTarget(const std::string& path);
 
-/// Creates a file beside `target` whose name is that of the target with `suffix`, a number when that is
-/// taken, and cut where a name would be longer than file systems allow. Null with `error` set on failure.
+/// Creates a file beside `target`, which it is to replace: its name is that of the target with `suffix`, a
+/// number when that is taken, and cut where a name would be longer than file systems allow. Null with `error`
+/// set on failure.
 std::unique_ptr<ByteFile> CreateBeside(FileSystem& files, const std::string& target,
                                        const std::string& suffix, std::string& path, int& error);
 

@@ -1,0 +1,46 @@
+// How an output that everything was written to gets its final form and its name, and what becomes of one that
+// failed.
+#ifndef MOVIECONV_WRITER_FILEFINISHER_H
+#define MOVIECONV_WRITER_FILEFINISHER_H
+
+#include "writer/FilePlan.h"
+#include "writer/FileRecord.h"
+#include "writer/FileSystem.h"
+#include "writer/PartFile.h"
+
+#include <memory>
+#include <string>
+
+namespace writer {
+
+/// Whatever fails leaves the target as it was and the temporary file playable. Its parameters outlive it.
+class FileFinisher {
+public:
+    FileFinisher(PartFile& part, const std::string& target, const FilePlan& plan, FileRecord& record,
+                 FileSystem& files)
+        : part_(part), target_(target), plan_(plan), record_(record), files_(files) {}
+
+    /// Writes the end, gives files of the MP4 family one index, syncs, and renames. Throws WriterFailure.
+    void Finish();
+
+    /// Leaves the temporary file of one that failed in a form that players take, or removes it.
+    void Abandon();
+
+private:
+    void FinishFragments();
+    void JoinInto(const std::string& path, const std::shared_ptr<ByteFile>& file);
+    void Publish(const std::string& path, ByteFile& file);
+    void TellLengths();
+    void Progress(double share);
+
+    PartFile& part_;
+    const std::string& target_;
+    const FilePlan& plan_;
+    FileRecord& record_;
+    FileSystem& files_;
+    double toldShare_ = 0;
+};
+
+} // namespace writer
+
+#endif

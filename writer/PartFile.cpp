@@ -1,0 +1,74 @@
+#include "writer/PartFile.h"
+
+#include "text/Path.h"
+#include "writer/WriterFailure.h"
+#include "writer/WriterStatus.h"
+
+#include <algorithm>
+#include <utility>
+
+namespace writer {
+
+PartFile::PartFile(const std::string& target, const FilePlan& plan, std::shared_ptr<FileRecord> record,
+                   FileSystem& files)
+    : record_(std::move(record)), files_(files) {
+    int error = 0;
+    std::unique_ptr<ByteFile> file = CreateBeside(files_, target, ".part", path_, error);
+    if (!file)
+        throw SystemFailure(kWriterErrorOpen, error, "No file can be created in the folder \"%s\"",
+                            text::FolderOf(target).c_str());
+    try {
+        io_ = std::make_unique<AvioFile>(std::move(file), AvioFile::Mode::kWrite,
+                                         [this] { return record_->AskAboutFullDisk(); });
+        muxer_ = std::make_unique<Muxer>(*plan.container, *io_, plan.Fragmented(), plan.bitExact);
+    } catch (...) {
+        files_.Remove(path_);
+        throw;
+    }
+}
+
+void PartFile::WriteHeader() {
+    muxer_->WriteHeader();
+    if (io_->Flush() != 0)
+        throw WriterFailure(kWriterErrorWrite, "");
+    TellSize();
+}
+
+void PartFile::Write(AVPacket& packet, int stream) {
+    muxer_->Write(packet, stream);
+    TellSize();
+}
+
+void PartFile::WriteTrailer() {
+    muxer_->WriteTrailer();
+    const int error = io_->Flush();
+    TellSize();
+    if (error != 0)
+        throw WriterFailure(kWriterErrorWrite, "");
+}
+
+void PartFile::CutToWhole() {
+    io_->Flush();
+    const int64_t size = io_->Size();
+    const int64_t whole = muxer_->WholeSize(size);
+    const bool cut = whole < size && File()->Truncate(whole) >= 0;
+    record_->Update([&](WriterStatus& status) { status.llBytesWritten = cut ? whole : size; });
+}
+
+void PartFile::Remove() {
+    files_.Remove(path_);
+    record_->SetTemporaryPath("");
+}
+
+WriterFailure PartFile::Explain(const std::exception_ptr& error) const noexcept {
+    if (const int code = io_->Error(); code != 0)
+        return SystemFailure(kWriterErrorWrite, code, "Writing to \"%s\" failed after %lld bytes",
+                             path_.c_str(), static_cast<long long>(io_->Size()));
+    return FailureOf(error);
+}
+
+void PartFile::TellSize() {
+    record_->Update([this](WriterStatus& status) { status.llBytesWritten = io_->Size(); });
+}
+
+} // namespace writer

@@ -1,0 +1,69 @@
+// The temporary file of an output while it grows: its name, its bytes, its multiplexer.
+#ifndef MOVIECONV_WRITER_PARTFILE_H
+#define MOVIECONV_WRITER_PARTFILE_H
+
+#include "writer/AvioFile.h"
+#include "writer/FilePlan.h"
+#include "writer/FileRecord.h"
+#include "writer/FileSystem.h"
+#include "writer/Muxer.h"
+
+#include <exception>
+#include <memory>
+#include <string>
+
+namespace writer {
+
+/// Created beside the target, under its name with ".part". Its record is told how it grows.
+class PartFile {
+public:
+    /// Throws WriterFailure, and leaves nothing behind then.
+    PartFile(const std::string& target, const FilePlan& plan, std::shared_ptr<FileRecord> record,
+             FileSystem& files);
+    PartFile(const PartFile&) = delete;
+    PartFile& operator=(const PartFile&) = delete;
+    ~PartFile() = default;
+
+    /// Streams are added to it before WriteHeader.
+    Muxer& Streams() { return *muxer_; }
+    const Muxer& Streams() const { return *muxer_; }
+
+    /// The header, out to the disk. Throws WriterFailure.
+    void WriteHeader();
+
+    /// Any thread. Throws WriterFailure.
+    void Write(AVPacket& packet, int stream);
+
+    /// What is left, out to the disk. Throws WriterFailure.
+    void WriteTrailer();
+
+    /// Cuts off what has begun and never ended, for want of room, memory or an end.
+    void CutToWhole();
+
+    void Remove();
+
+    /// Tells the record how much is on the disk.
+    void TellSize();
+
+    /// Whether it has certainly lost its name, as with its folder. Allocates nothing.
+    bool IsMissing() const { return files_.IsMissing(path_); }
+
+    /// The failure in the terms of the status header. A failed file explains more than what the multiplexer
+    /// made of it. Allocates nothing.
+    WriterFailure Explain(const std::exception_ptr& error) const noexcept;
+
+    const std::string& Path() const { return path_; }
+    const std::shared_ptr<ByteFile>& File() const { return io_->File(); }
+    bool Broken() const { return io_->Error() != 0; }
+
+private:
+    const std::shared_ptr<FileRecord> record_;
+    FileSystem& files_;
+    std::string path_;
+    std::unique_ptr<AvioFile> io_;
+    std::unique_ptr<Muxer> muxer_;
+};
+
+} // namespace writer
+
+#endif

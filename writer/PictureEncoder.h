@@ -1,0 +1,60 @@
+// The encoder for pictures. It belongs to one thread.
+#ifndef MOVIECONV_WRITER_PICTUREENCODER_H
+#define MOVIECONV_WRITER_PICTUREENCODER_H
+
+#include "writer/Encoder.h"
+#include "writer/FormatTable.h"
+
+#include <cstdint>
+#include <deque>
+
+namespace writer {
+
+/// Parameters of a picture encoder.
+struct PictureSettings {
+    int width;
+    int height;
+    AVRational rate;
+    AVRational sampleAspect;
+    int64_t bitrate;    ///< Bits per second.
+    int64_t maxBitrate; ///< Upper rate; 0: no limit.
+    int threads;
+    bool inOrder; ///< Pictures are coded in the order in which they are shown.
+    AVPixelFormat format;
+    bool fullRange; ///< Luma covers 0 to 255.
+    AVColorPrimaries primaries;
+    AVColorTransferCharacteristic transfer;
+    AVColorSpace matrix;
+};
+
+/// The encoder itself only counts pictures, so that its rate control sees a steady rate and no codec's limits
+/// on time bases matter; packets carry the ticks that were given with the pictures.
+class PictureEncoder {
+public:
+    /// Throws WriterFailure (kWriterErrorCodec). `ticksPerPicture` is the usual distance of two pictures.
+    PictureEncoder(const PictureCodec& codec, const PictureSettings& settings, EncoderFlags flags,
+                   int ticksPerPicture);
+
+    /// Encodes a picture that is shown from `tick` on; ticks rise. Throws WriterFailure (kWriterErrorEncode).
+    void Encode(AVFrame& frame, int64_t tick, const PacketTaker& take);
+
+    /// Hands out what is still inside. Nothing can be encoded afterwards.
+    void Finish(const PacketTaker& take);
+
+    const AVCodecContext& Context() const { return *context_; }
+
+private:
+    void Send(AVFrame* frame, const PacketTaker& take);
+    int64_t TickOf(int64_t index) const;
+
+    const int ticksPerPicture_;
+    av::CodecContext context_;
+    av::Packet packet_;
+    std::deque<int64_t> ticks_; ///< Ticks of pictures that packets may still name, from firstIndex_ on.
+    int64_t firstIndex_ = 0;
+    int64_t nextIndex_ = 0;
+};
+
+} // namespace writer
+
+#endif

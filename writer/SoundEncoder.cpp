@@ -1,0 +1,99 @@
+#include "writer/SoundEncoder.h"
+
+#include <algorithm>
+#include <new>
+#include <string>
+
+namespace writer {
+namespace {
+
+/// Sample frames in a frame of codecs that take any number.
+constexpr int kFreeFrameSize = 1024;
+
+/// The nearest of `rates`, ended by 0, that is not below `asked`, else the highest.
+int ChooseSampleRate(const int* rates, int asked) {
+    if (rates == nullptr)
+        return asked;
+    int above = 0;
+    int highest = 0;
+    for (; *rates != 0; ++rates) {
+        highest = std::max(highest, *rates);
+        if (*rates >= asked && (above == 0 || *rates < above))
+            above = *rates;
+    }
+    return above != 0 ? above : highest;
+}
+
+bool TakesLayout(const AVCodec& codec, const AVChannelLayout& layout) {
+    if (codec.ch_layouts == nullptr)
+        return true;
+    for (const AVChannelLayout* known = codec.ch_layouts; known->nb_channels != 0; ++known)
+        if (av_channel_layout_compare(known, &layout) == 0)
+            return true;
+    return false;
+}
+
+/// The usual layout of the largest number of channels, at most `asked`, that the codec takes; every one in
+/// the table takes one channel.
+void ChooseLayout(const AVCodec& codec, int asked, AVChannelLayout& layout) {
+    for (int channels = asked; channels > 0; --channels) {
+        const av::ChannelLayout candidate(channels);
+        if (candidate.Get()->order != AV_CHANNEL_ORDER_UNSPEC && TakesLayout(codec, *candidate.Get())) {
+            av_channel_layout_copy(&layout, candidate.Get());
+            return;
+        }
+    }
+}
+
+AVSampleFormat ChooseSampleFormat(const AVCodec& codec, int bitsPerSample) {
+    if (codec.sample_fmts == nullptr)
+        return AV_SAMPLE_FMT_S16;
+    for (const AVSampleFormat* format = codec.sample_fmts; *format != AV_SAMPLE_FMT_NONE; ++format)
+        if (bitsPerSample > 16 && *format == AV_SAMPLE_FMT_S32)
+            return *format;
+    return codec.sample_fmts[0];
+}
+
+int64_t ClampBitrate(const SoundCodec& codec, int64_t asked, const AVCodecContext& context) {
+    const double samples = static_cast<double>(context.sample_rate) * context.ch_layout.nb_channels;
+    const auto most = static_cast<int64_t>(codec.maxBits * samples);
+    const auto least = static_cast<int64_t>(codec.minBits * samples);
+    return std::clamp(asked, least, most);
+}
+
+} // namespace
+
+SoundEncoder::SoundEncoder(const SoundCodec& codec, const SoundSettings& settings, EncoderFlags flags)
+    : context_(NewEncoder(FindEncoder(codec, settings.bitsPerSample), codec.code, flags)),
+      packet_(av::NewPacket()) {
+    AVCodecContext& context = *context_;
+    const int rate =
+        codec.maxSampleRate > 0 ? std::min(settings.sampleRate, codec.maxSampleRate) : settings.sampleRate;
+    context.sample_rate = ChooseSampleRate(
+        settings.sampleRates != nullptr ? settings.sampleRates : context.codec->supported_samplerates, rate);
+    context.time_base = {1, context.sample_rate};
+    context.sample_fmt = ChooseSampleFormat(*context.codec, settings.bitsPerSample);
+    ChooseLayout(*context.codec, std::min(settings.channels, codec.maxChannels), context.ch_layout);
+    if (codec.maxBits > 0) {
+        context.bit_rate = ClampBitrate(codec, settings.bitrate, context);
+        context.rc_max_rate = settings.maxBitrate > 0 ? std::max(settings.maxBitrate, context.bit_rate) : 0;
+    }
+    context.thread_count = 1;
+    OpenEncoder(context, codec.code,
+                "sound of " + std::to_string(context.sample_rate) + " Hz with " +
+                    std::to_string(context.ch_layout.nb_channels) + " channels at " +
+                    std::to_string(context.bit_rate) + " bits a second");
+    frameSize_ = context.frame_size > 0 ? context.frame_size : kFreeFrameSize;
+}
+
+void SoundEncoder::Encode(AVFrame& frame, const PacketTaker& take) {
+    frame.pts = samples_;
+    samples_ += frame.nb_samples;
+    writer::Encode(*context_, &frame, *packet_, take);
+}
+
+void SoundEncoder::Finish(const PacketTaker& take) {
+    writer::Encode(*context_, nullptr, *packet_, take);
+}
+
+} // namespace writer
