@@ -1,5 +1,7 @@
 #include "bench/colour/Families.h"
 
+#include "bench/colour/Swscale.h"
+
 #include <cstring>
 #include <libyuv.h>
 
@@ -190,6 +192,20 @@ void peerDoublePlane(Pictures& p) {
                        p.width, p.width, p.height, libyuv::kFilterNone);
 }
 
+// swscale
+// -------------------------------------------------------------------------------------------------------
+
+template <Layout From, Layout To>
+void accurate(Pictures& p) {
+    convertAccurately(p, From, To);
+}
+constexpr auto kPlanesFromRgb32 = accurate<Layout::Rgb32, Layout::Planes>;
+constexpr auto kPlanesFromRgb24 = accurate<Layout::Rgb24, Layout::Planes>;
+constexpr auto kRgb32FromPlanes = accurate<Layout::Planes, Layout::Rgb32>;
+constexpr auto kRgb24FromPlanes = accurate<Layout::Planes, Layout::Rgb24>;
+constexpr auto kRgb24FromPacked = accurate<Layout::Packed, Layout::Rgb24>;
+constexpr auto kPackedFromRgb24 = accurate<Layout::Rgb24, Layout::Packed>;
+
 constexpr Goals kNone{};
 constexpr Goals kAtPar{1.0, 1.0, 1.0};
 
@@ -200,28 +216,32 @@ constexpr Family kFamilies[] = {
      "ARGBToI420",
      peerPlanesFromRgb32,
      {0.65, 0.80, 1.10},
-     {1.45, 1.75, 1.65}},
+     {1.45, 1.75, 1.65},
+     kPlanesFromRgb32},
     {"Argb_2_yuv420",
      Kind::RgbToYuv,
      planesFromRgb32<Argb_2_yuv420>,
      "ARGBToI420",
      peerPlanesFromRgb32,
      {0.65, 0.80, 1.10},
-     {1.45, 1.75, 1.65}},
+     {1.45, 1.75, 1.65},
+     kPlanesFromRgb32},
     {"Rgb32_2_yuv420_Ex",
      Kind::RgbToYuv,
      planesFromPixels,
      "ARGBToI420",
      peerPlanesFromRgb32,
      {0.65, 0.80, 1.10},
-     {1.45, 1.75, 1.65}},
+     {1.45, 1.75, 1.65},
+     kPlanesFromRgb32},
     {"Rgb24_2_yuv420",
      Kind::RgbToYuv,
      planesFromRgb24<Rgb24_2_yuv420>,
      "RGB24ToI420",
      peerPlanesFromRgb24,
      {0.90, 1.0, 1.2},
-     {2.3, 2.4, 2.0}},
+     {2.3, 2.4, 2.0},
+     kPlanesFromRgb24},
     {"Rgb24_2_yuv420Simple", Kind::RgbToYuv, planesFromRgb24<Rgb24_2_yuv420Simple>, "RGB24ToI420",
      peerPlanesFromRgb24, kNone, kNone},
     {"Rgb32_2_yuv420A",
@@ -244,7 +264,8 @@ constexpr Family kFamilies[] = {
      "I420ToARGB",
      peerRgb32FromPlanes,
      {1.2, 1.2, 1.15},
-     {2.0, 2.2, 1.3}},
+     {2.0, 2.2, 1.3},
+     kRgb32FromPlanes},
     {"Yuv420_2_rgb32",
      Kind::YuvToRgb,
      rgb32FromPlanes<Yuv420_2_rgb32>,
@@ -258,7 +279,8 @@ constexpr Family kFamilies[] = {
      "I420ToRGB24",
      peerRgb24FromPlanes,
      {1.25, 1.3, 1.4},
-     {3.0, 3.3, 1.95}},
+     {3.0, 3.3, 1.95},
+     kRgb24FromPlanes},
     {"Yuv420_2_rgb24Simple", Kind::YuvToRgb, rgb24FromPlanes<Yuv420_2_rgb24Simple>, "I420ToRGB24",
      peerRgb24FromPlanes, kNone, kNone},
     {"YUY2_2_Rgb24",
@@ -267,14 +289,16 @@ constexpr Family kFamilies[] = {
      "YUY2ToARGB + ARGBToRGB24",
      peerRgb24FromPacked,
      {1.1, 1.2, 1.4},
-     {2.3, 2.4, 2.2}},
+     {2.3, 2.4, 2.2},
+     kRgb24FromPacked},
     {"Rgb24_2_YUY2",
      Kind::RgbToYuv,
      packedFromRgb24,
      "RGB24ToARGB + ARGBToYUY2",
      peerPackedFromRgb24,
      {1.2, 1.3, 1.6},
-     {3.3, 3.8, 3.0}},
+     {3.3, 3.8, 3.0},
+     kPackedFromRgb24},
     {"YUY2_2_Yuv420",
      Kind::Average,
      planesFromPacked,

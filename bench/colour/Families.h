@@ -27,6 +27,7 @@ struct Family {
     void (*peer)(Pictures&);
     Goals goalsAvx2;
     Goals goalsAvx512;
+    void (*accurate)(Pictures&) = nullptr; ///< By swscale; null where the routine computes no colours.
 };
 
 std::span<const Family> families();

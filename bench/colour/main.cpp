@@ -4,6 +4,7 @@
 #include "bench/colour/Exactness.h"
 #include "bench/colour/Families.h"
 #include "bench/colour/Levels.h"
+#include "bench/colour/PeerErrors.h"
 #include "bench/colour/Table.h"
 
 #include <algorithm>
@@ -71,6 +72,15 @@ void addAgainstPeer(const Level& level, const Family& family) {
             });
 }
 
+void addAgainstAccurate(const Level& level, const Family& family) {
+    for (const auto& [width, height] : kSizes)
+        add("Times faster than swscale, accurate", level, family, {width, height}, 0,
+            [](benchmark::State& state, const Family& f, Pictures& p) {
+                compare(
+                    state, [&] { f.ours(p); }, [&] { f.accurate(p); });
+            });
+}
+
 /// An odd size shall take at most 5 % longer than the even one that is a column and a row larger.
 void addOddAgainstEven(const Level& level, const Family& family) {
     constexpr Size kOddSizes[] = {{321, 241}, {641, 479}, {1921, 1079}};
@@ -120,6 +130,9 @@ void addAll(const std::vector<Level>& levels) {
         }
     }
     for (const Family& family : families())
+        if (family.accurate != nullptr)
+            addAgainstAccurate(best, family);
+    for (const Family& family : families())
         addOddAgainstEven(best, family);
     for (const Family& family : families())
         addTinyAgainstLarge(best, family);
@@ -153,6 +166,7 @@ int main(int argc, char** argv) {
         for (const bench::Level& level : levels)
             std::printf(" %s", level.name);
         std::printf("\n");
+        bench::printPeerErrors();
     }
     std::fflush(stdout);
     bench::TableReporter table;
