@@ -24,44 +24,59 @@ struct Terms {
     __m512i low, high;
 };
 
-inline __m512i Times(__m512i words, int factor) {
-    return _mm512_mullo_epi16(words, _mm512_set1_epi16(static_cast<int16_t>(factor)));
-}
 inline __m512i Plus(__m512i words, int constant) {
     return _mm512_add_epi16(words, _mm512_set1_epi16(static_cast<int16_t>(constant)));
 }
 
+/// ofU * (U - 128) + ofV * (V - 128) from such bytes, alternating.
+inline __m512i Weighted(__m512i centred, int ofU, int ofV) {
+    return _mm512_maddubs_epi16(_mm512_set1_epi16(static_cast<int16_t>(ofU | ofV << 8)), centred);
+}
+
+/// The same of U and V themselves with a constant, shifted.
 template <class Form>
-__m512i RedTerm(__m512i v) {
-    const __m512i rest =
-        _mm512_srai_epi16(Plus(Times(v, Form::kRedRest), Form::kRedRestConstant), Form::kShift);
-    return _mm512_add_epi16(Plus(Times(v, Form::kRedWhole), Form::kRedConstant), rest);
+__m512i Rest(__m512i centred, int ofU, int ofV, int constant) {
+    return _mm512_srai_epi16(Plus(Weighted(centred, ofU, ofV), constant + 128 * (ofU + ofV)), Form::kShift);
 }
 
 template <class Form>
-__m512i GreenTerm(__m512i u, __m512i v) {
-    const __m512i rests = _mm512_add_epi16(Times(u, Form::kGreenURest), Times(v, Form::kGreenVRest));
-    const __m512i wholes = _mm512_add_epi16(Times(u, Form::kGreenUWhole), Times(v, Form::kGreenVWhole));
-    return _mm512_add_epi16(Plus(wholes, Form::kGreenConstant),
-                            _mm512_srai_epi16(Plus(rests, Form::kGreenRestConstant), Form::kShift));
+__m512i RedTerm(__m512i centred) {
+    const __m512i whole = Weighted(centred, 0, Form::kRedWhole);
+    return _mm512_add_epi16(Plus(whole, Form::kRedConstant + 128 * Form::kRedWhole),
+                            Rest<Form>(centred, 0, Form::kRedRest, Form::kRedRestConstant));
+}
+
+/// The whole factors of green are negative, the weights are not.
+template <class Form>
+__m512i GreenTerm(__m512i centred) {
+    const __m512i whole = Weighted(centred, -Form::kGreenUWhole, -Form::kGreenVWhole);
+    const __m512i rest = Rest<Form>(centred, Form::kGreenURest, Form::kGreenVRest, Form::kGreenRestConstant);
+    return Plus(_mm512_sub_epi16(rest, whole),
+                Form::kGreenConstant + 128 * (Form::kGreenUWhole + Form::kGreenVWhole));
 }
 
 template <class Form>
-__m512i BlueRestTerm(__m512i u) {
-    const __m512i rest =
-        _mm512_srai_epi16(Plus(Times(u, Form::kBlueRest), Form::kBlueRestConstant), Form::kShift);
-    return _mm512_add_epi16(Plus(Times(u, Form::kBlueWhole), Form::kBlueConstant), rest);
+__m512i BlueRestTerm(__m512i centred) {
+    const __m512i whole = Weighted(centred, Form::kBlueWhole, 0);
+    return _mm512_add_epi16(Plus(whole, Form::kBlueConstant + 128 * Form::kBlueWhole),
+                            Rest<Form>(centred, Form::kBlueRest, 0, Form::kBlueRestConstant));
 }
 
-/// All that 32 chroma samples give their pixels, from words of U and V.
+/// All that 32 chroma samples give their pixels, from bytes of U and V, alternating.
 template <class Form>
 struct ChromaTerms {
-    ChromaTerms(__m512i u, __m512i v)
-        : red(RedTerm<Form>(v)),
-          green(GreenTerm<Form>(u, v)),
-          blue(_mm512_xor_si512(_mm512_slli_epi16(u, 8), _mm512_set1_epi16(-0x8000))),
-          blueRest(BlueRestTerm<Form>(u)) {}
+    explicit ChromaTerms(__m512i uv) : ChromaTerms(Centred{_mm512_xor_si512(uv, _mm512_set1_epi8(-128))}) {}
     Terms red, green, blue, blueRest;
+
+private:
+    struct Centred {
+        __m512i bytes;
+    };
+    explicit ChromaTerms(Centred uv)
+        : red(RedTerm<Form>(uv.bytes)),
+          green(GreenTerm<Form>(uv.bytes)),
+          blue(_mm512_slli_epi16(uv.bytes, 8)),
+          blueRest(BlueRestTerm<Form>(uv.bytes)) {}
 };
 
 /// Bytes of 64 pixels.
@@ -161,17 +176,19 @@ private:
     }
 };
 
-/// Chroma bytes as words, in the order of the pixels.
-class ChromaWords {
+/// Bytes of U and V, alternating, in the order of the pixels.
+class ChromaPairs {
 public:
     template <class Columns>
-    __m512i operator()(Columns columns, const uint8_t* row, ptrdiff_t x) const {
-        const __m256i bytes = LoadHalf(columns, row + x / 2, (columns.count + 1) / 2);
-        return _mm512_maskz_permutexvar_epi8(~kOddBytes, places_, _mm512_castsi256_si512(bytes));
+    __m512i operator()(Columns columns, const uint8_t* u, const uint8_t* v, ptrdiff_t x) const {
+        const ptrdiff_t samples = (columns.count + 1) / 2;
+        const __m512i both = _mm512_inserti64x4(_mm512_castsi256_si512(LoadHalf(columns, u + x / 2, samples)),
+                                                LoadHalf(columns, v + x / 2, samples), 1);
+        return _mm512_permutexvar_epi8(places_, both);
     }
 
 private:
-    static constexpr Table kPlaces = MakeTable([](int i) { return PixelAt(i) / 2; });
+    static constexpr Table kPlaces = MakeTable([](int i) { return PixelAt(i) / 2 + i % 2 * 32; });
     __m512i places_ = kPlaces.Load();
 };
 
@@ -181,12 +198,12 @@ void RgbFrom420(Rows rgb, Planes420 source, Size size) {
         return (kAvx2Kernels.*kKernel)(rgb, source, size);
     // Groups of four pixels, as 32-bit places.
     static constexpr Table kLuma = MakeTable([](int i) { return i % 4 == 0 ? PixelAt(i) / 4 : 0; });
-    const ChromaWords words;
+    const ChromaPairs chroma;
     const Target store;
     const __m512i order = kLuma.Load();
     ForRowPairs(source, rgb, size.height, [&](PlanesPair from, RowPair to, ptrdiff_t, ptrdiff_t) {
         ForSteps<kStep>(size.width, [&](ptrdiff_t x, auto columns) {
-            const ChromaTerms<Form> terms(words(columns, from.u, x), words(columns, from.v, x));
+            const ChromaTerms<Form> terms(chroma(columns, from.u, from.v, x));
             const auto luma = [&](const uint8_t* row) {
                 return _mm512_permutexvar_epi32(order, Load(columns, row + x, columns.count));
             };

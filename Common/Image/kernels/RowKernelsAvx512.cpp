@@ -41,20 +41,17 @@ void Bgr24FromPacked(Rows rgb, Rows packed, Size size) {
     using Form = FastYuvForm;
     using Order = Packed<kOrder>;
     static constexpr Table kLuma = MakeTable([](int i) { return Order::Y(PixelAt(i)); });
-    static constexpr Table kU = MakeTable([](int i) { return Order::U(PixelAt(i)); });
-    static constexpr Table kV = MakeTable([](int i) { return Order::V(PixelAt(i)); });
+    static constexpr Table kChroma =
+        MakeTable([](int i) { return i % 2 == 0 ? Order::U(PixelAt(i)) : Order::V(PixelAt(i)); });
     const Bgr24Target<Memory> store;
-    const __m512i lowBytes = _mm512_set1_epi16(0xFF);
     const Pick luma(kLuma);
-    const Pick u(kU);
-    const Pick v(kV);
+    const Pick chroma(kChroma);
     for (ptrdiff_t row = 0; row < size.height; ++row) {
         uint8_t* const target = rgb[row];
         const uint8_t* const source = packed[row];
         ForSteps<kStep>(size.width, [&](ptrdiff_t x, auto columns) {
             const PackedRun run = LoadPacked<kOrder>(columns, source, x);
-            const ChromaTerms<Form> terms(_mm512_and_si512(u(run), lowBytes),
-                                          _mm512_and_si512(v(run), lowBytes));
+            const ChromaTerms<Form> terms(chroma(run));
             store(columns, target, x, ToRgb<Form>(luma(run), terms));
         });
     }
