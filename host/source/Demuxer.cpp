@@ -4,8 +4,6 @@
 
 #include <algorithm>
 #include <cstdlib>
-#include <new>
-#include <system_error>
 #include <utility>
 
 namespace movieconv {
@@ -13,28 +11,22 @@ namespace {
 
 constexpr std::size_t kEnoughPackets = 32;
 constexpr std::size_t kEnoughBytes = 1 << 20;
-constexpr int kToleratedFailures = 100;                // reads in a row that may fail on damaged data
+constexpr std::size_t kMostBytes = 32 << 20; // while sound stays away
+constexpr int64_t kLatest =
+    10 * kTicksPerSecond;               // by which sound may come later in the file than its pictures
+constexpr int kToleratedFailures = 100; // reads in a row that may fail on damaged data
 constexpr int64_t kLargestStep = 10 * kTicksPerSecond; // between packets of one stream; more is a new clock
 constexpr int64_t kLargestFall = kTicksPerSecond / 2;  // likewise, backwards
 constexpr double kPreroll = 0.2;                       // codecs need a little before the first good sample
 constexpr int kProbedPackets = 2000;                   // read to find the picture where decoding can begin
 
-/// Writes what went wrong into `reason`, which stays as it is when there is no memory for it.
-void Describe(const std::exception& error, std::string& reason) noexcept {
-    try {
-        const bool threads = dynamic_cast<const std::system_error*>(&error) != nullptr;
-        reason = std::string(threads ? "no thread can be started: " : "") + error.what();
-    } catch (const std::bad_alloc&) {
-    }
-}
-
 } // namespace
 
-Demuxer::Demuxer(Source& source) : source_(source) {
-    if (const AVStream* pictures = source.PictureStream())
+Demuxer::Demuxer(Source& source, Failures& failures) : source_(source), failures_(failures) {
+    if (const auto& pictures = source.Info().pictures)
         queues_[pictures->index];
-    if (const AVStream* sound = source.SoundStream())
-        queues_[sound->index];
+    if (const auto& sound = source.Info().sound)
+        queues_[sound->index].mayBeSilent = source.Info().pictures.has_value();
 }
 
 Demuxer::~Demuxer() {
@@ -45,19 +37,19 @@ Demuxer::~Demuxer() {
 
 bool Demuxer::Seek(double seconds) {
     const std::lock_guard lock(mutex_);
-    if (started_ || seconds == soughtSeconds_)
+    if (started_ || stopping_ || seconds == soughtSeconds_)
         return soughtWell_ && seconds == soughtSeconds_;
     soughtSeconds_ = seconds;
-    soughtWell_ = source_.IsSeekable() && (SeekBefore(seconds) || source_.Rewind());
+    soughtWell_ = source_.Reader().IsSeekable() && (SeekBefore(seconds) || source_.Reader().Rewind());
     if (!soughtWell_ && moved_)
-        readError_ = "it cannot be read from its start again";
+        failures_.Note("it cannot be read from its start again");
     return soughtWell_;
 }
 
 /// Goes to a time from which `seconds` can be decoded. Containers seek by decoding order or land beside a key
 /// picture, so it goes back until one lies before. False when there is none after the source's start.
 bool Demuxer::SeekBefore(double seconds) {
-    AVFormatContext* context = source_.Context();
+    AVFormatContext* context = source_.Reader().Context();
     const int64_t start = context->start_time != AV_NOPTS_VALUE ? context->start_time : 0;
     double back = kPreroll;
     while (back < seconds) {
@@ -80,12 +72,13 @@ bool Demuxer::KeyPictureAtOrBefore(int64_t mediaTime) {
     if (pictures == nullptr)
         return true;
     const av::Packet packet = av::NewPacket();
-    for (int i = 0; i < kProbedPackets && av_read_frame(source_.Context(), packet.get()) >= 0; ++i) {
+    for (int i = 0; i < kProbedPackets && av_read_frame(source_.Reader().Context(), packet.get()) >= 0; ++i) {
         const bool isKey = packet->stream_index == pictures->index && (packet->flags & AV_PKT_FLAG_KEY) != 0;
         const int64_t stamp = packet->pts != AV_NOPTS_VALUE ? packet->pts : packet->dts;
         av_packet_unref(packet.get());
         if (isKey)
-            return stamp == AV_NOPTS_VALUE || source_.MediaTime(stamp, pictures) <= mediaTime;
+            return stamp == AV_NOPTS_VALUE ||
+                   source_.Reader().MediaTime(stamp, pictures->time_base) <= mediaTime;
     }
     return false;
 }
@@ -97,12 +90,12 @@ void Demuxer::Start() {
     }
 }
 
-av::Packet Demuxer::Take(int stream) {
-    std::unique_lock lock(mutex_);
+/// Waits until the stream's queue holds a packet, or the reading has ended, or `known` holds.
+template <class Known>
+av::Packet Demuxer::Take(std::unique_lock<std::mutex>& lock, Queue& queue, Known known) {
     Start();
-    Queue& queue = queues_.at(stream);
     WaitAndTell(
-        changed_, lock, [&] { return stopping_ || ended_ || !queue.packets.empty(); },
+        changed_, lock, [&] { return stopping_ || ended_ || !queue.packets.empty() || known(); },
         L"Movie::A decoder waits for the source");
     if (stopping_ || queue.packets.empty())
         return nullptr;
@@ -116,34 +109,43 @@ av::Packet Demuxer::Take(int stream) {
     return packet;
 }
 
+av::Packet Demuxer::Take(int stream) {
+    std::unique_lock lock(mutex_);
+    return Take(lock, queues_.at(stream), [] { return false; });
+}
+
+std::variant<av::Packet, int64_t> Demuxer::TakeOrSilence(int stream) {
+    std::unique_lock lock(mutex_);
+    Queue& queue = queues_.at(stream);
+    std::optional<int64_t> silence;
+    av::Packet packet = Take(lock, queue, [&] { return (silence = Silence(queue)).has_value(); });
+    if (packet || !silence)
+        return packet;
+    queue.silentUntil = *silence;
+    lock.unlock();
+    changed_.notify_all(); // it may be waiting for this
+    return *silence;
+}
+
+/// Up to where an empty queue's stream is known to be silent; nothing unless that is news.
+std::optional<int64_t> Demuxer::Silence(const Queue& queue) const {
+    if (!queue.mayBeSilent || !queue.packets.empty() || Held() < kMostBytes)
+        return std::nullopt;
+    int64_t reached = INT64_MIN + kLatest;
+    for (const auto& [stream, other] : queues_)
+        reached = std::max(reached, other.end.value_or(reached));
+    const int64_t silentUntil = reached - kLatest;
+    const bool isNews = silentUntil > std::max(queue.silentUntil, queue.end.value_or(INT64_MIN));
+    return isNews ? std::optional(silentUntil) : std::nullopt;
+}
+
 void Demuxer::Stop() {
     {
         const std::lock_guard lock(mutex_);
         stopping_ = true; // before the read is interrupted, which is no failure then
     }
-    source_.Interrupt();
+    source_.Reader().Interrupt();
     changed_.notify_all();
-}
-
-void Demuxer::Fail(const std::exception_ptr& failure) noexcept {
-    std::string reason = "no memory"; // short enough to need none
-    try {
-        std::rethrow_exception(failure);
-    } catch (const std::bad_alloc&) {
-    } catch (const std::exception& error) {
-        Describe(error, reason);
-    }
-    {
-        const std::lock_guard lock(mutex_);
-        if (readError_.empty())
-            readError_ = std::move(reason);
-    }
-    Stop();
-}
-
-std::string Demuxer::ReadError() const {
-    const std::lock_guard lock(mutex_);
-    return readError_;
 }
 
 std::optional<int64_t> Demuxer::EndOf(int stream) const {
@@ -157,17 +159,27 @@ int Demuxer::ClockJumps() const {
     return clockJumps_;
 }
 
-/// Whether no queue is empty and each has so many packets, or all together have so many bytes.
-bool Demuxer::Holds(std::size_t packets, std::size_t bytes) const {
+std::size_t Demuxer::Held() const {
     std::size_t held = 0;
+    for (const auto& [stream, queue] : queues_)
+        held += queue.bytes;
+    return held;
+}
+
+std::size_t Demuxer::Bytes() const {
+    const std::lock_guard lock(mutex_);
+    return Held();
+}
+
+/// Whether each queue has so many packets, or all together have so many bytes, and nobody waits for a packet.
+bool Demuxer::Holds(std::size_t packets, std::size_t bytes) const {
     bool allFilled = true;
     for (const auto& [stream, queue] : queues_) {
-        if (queue.packets.empty())
+        if (queue.packets.empty() && !Silence(queue))
             return false;
-        held += queue.bytes;
         allFilled = allFilled && queue.packets.size() >= packets;
     }
-    return allFilled || held >= bytes;
+    return allFilled || Held() >= bytes;
 }
 
 /// Waits until there is something to read for. False when there is nothing any more.
@@ -180,7 +192,7 @@ bool Demuxer::AwaitDemand() {
 }
 
 void Demuxer::Run() {
-    Attempt([this] {
+    failures_.Attempt([this] {
         while (AwaitDemand() && ReadOne()) {
         }
     });
@@ -194,16 +206,14 @@ void Demuxer::Run() {
 /// Reads one packet and queues it. False at the end, or when nothing more can be read.
 bool Demuxer::ReadOne() {
     av::Packet packet = av::NewPacket();
-    const int result = av_read_frame(source_.Context(), packet.get());
+    const int result = av_read_frame(source_.Reader().Context(), packet.get());
     av::CheckMemory(result);
     if (result == AVERROR(EAGAIN) || (result == AVERROR_INVALIDDATA && ++failedReads_ < kToleratedFailures))
         return true;
     if (result < 0) {
         const std::lock_guard lock(mutex_);
-        if (result != AVERROR_EOF && !stopping_)
-            readError_ = av::ErrorText(result);
-        else if (!stopping_ && readError_.empty())
-            readError_ = source_.Refusal();
+        if (!stopping_)
+            failures_.Note(result != AVERROR_EOF ? av::ErrorText(result) : source_.Reader().File().Refusal());
         return false;
     }
     failedReads_ = 0;
@@ -226,15 +236,16 @@ std::optional<int64_t> Demuxer::EndOf(const AVPacket& packet) const {
     const int64_t stamp = packet.pts != AV_NOPTS_VALUE ? packet.pts : packet.dts;
     if (stamp == AV_NOPTS_VALUE)
         return std::nullopt;
-    return source_.MediaTime(stamp + packet.duration, source_.Context()->streams[packet.stream_index]);
+    return source_.Reader().MediaTime(stamp + packet.duration,
+                                      source_.Reader().Context()->streams[packet.stream_index]->time_base);
 }
 
 /// Recordings joined end to end start a new clock in the middle. From there on the stamps of all streams are
 /// shifted so that time goes on where it stopped.
 void Demuxer::RepairClock(AVPacket& packet) {
-    if ((source_.Context()->iformat->flags & AVFMT_TS_DISCONT) == 0 || packet.dts == AV_NOPTS_VALUE)
+    if ((source_.Reader().Context()->iformat->flags & AVFMT_TS_DISCONT) == 0 || packet.dts == AV_NOPTS_VALUE)
         return;
-    const AVStream* stream = source_.Context()->streams[packet.stream_index];
+    const AVStream* stream = source_.Reader().Context()->streams[packet.stream_index];
     const AVRational mediaBase{1, kTicksPerSecond};
     const int64_t stamp = av_rescale_q(packet.dts, stream->time_base, mediaBase);
     const auto due = due_.find(packet.stream_index);

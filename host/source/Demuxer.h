@@ -1,28 +1,30 @@
 // Reads packets ahead on a thread of its own and hands them to the decoding threads.
 //
 // One thread reads; at most one thread takes the packets of each stream. Reading stops while the queues hold
-// enough, but never while one of them is empty: a badly interleaved file may need many packets of one stream
-// before the next one of the other arrives.
+// enough. An empty one makes it go on, since a badly interleaved file may need many packets of one stream
+// before the next one of the other arrives; but where sound stays away for long, its taker is told that there
+// is silence, or the pictures of all the rest would be queued.
 #ifndef MOVIECONV_HOST_SOURCE_DEMUXER_H
 #define MOVIECONV_HOST_SOURCE_DEMUXER_H
 
+#include "host/source/Failures.h"
 #include "host/source/Source.h"
 #include "thread/Stall.h"
 
 #include <condition_variable>
 #include <deque>
-#include <exception>
 #include <map>
 #include <mutex>
 #include <optional>
-#include <string>
 #include <thread>
+#include <variant>
 
 namespace movieconv {
 
 class Demuxer {
 public:
-    explicit Demuxer(Source& source);
+    /// What ends the reading early is noted in `failures`.
+    Demuxer(Source& source, Failures& failures);
     ~Demuxer();
     Demuxer(const Demuxer&) = delete;
     Demuxer& operator=(const Demuxer&) = delete;
@@ -35,27 +37,18 @@ public:
     /// The next packet of a stream; waits for it. Null at the end of the stream or after Stop.
     av::Packet Take(int stream);
 
+    /// The same for sound, or the media time up to which there is none, when that is known: reading is far
+    /// beyond it.
+    std::variant<av::Packet, int64_t> TakeOrSilence(int stream);
+
     /// Ends reading and wakes everyone who waits.
     void Stop();
 
-    /// Does a part of the work of reading and decoding. False when it threw, for want of memory or of
-    /// threads: then both streams end and ReadError tells why.
-    template <class Work>
-    bool Attempt(Work work) {
-        try {
-            work();
-            return true;
-        } catch (...) {
-            Fail(std::current_exception());
-            return false;
-        }
-    }
-
-    /// What ended the reading early; empty when it came to the end of the file.
-    std::string ReadError() const;
-
     /// Where the last packet of a stream ends that was read so far, in media time; nothing without one.
     std::optional<int64_t> EndOf(int stream) const;
+
+    /// Bytes read ahead and not taken yet.
+    std::size_t Bytes() const;
 
     /// Times that the source's clock jumped and was put right.
     int ClockJumps() const;
@@ -64,12 +57,17 @@ private:
     struct Queue {
         std::deque<av::Packet> packets;
         std::size_t bytes = 0;
-        std::optional<int64_t> end; // in media time, of what was read
+        std::optional<int64_t> end;      // in media time, of what was read
+        int64_t silentUntil = INT64_MIN; // told to the taker
+        bool mayBeSilent = false;
     };
 
     void Start();
     void Run();
-    void Fail(const std::exception_ptr& failure) noexcept;
+    template <class Known>
+    av::Packet Take(std::unique_lock<std::mutex>& lock, Queue& queue, Known known);
+    std::optional<int64_t> Silence(const Queue& queue) const;
+    std::size_t Held() const;
     bool AwaitDemand();
     bool ReadOne();
     bool SeekBefore(double seconds);
@@ -79,6 +77,7 @@ private:
     std::optional<int64_t> EndOf(const AVPacket& packet) const;
 
     Source& source_;
+    Failures& failures_;
     double soughtSeconds_ = -1;
     bool soughtWell_ = false;
     bool moved_ = false; // away from the start
@@ -89,7 +88,6 @@ private:
     bool started_ = false;
     bool stopping_ = false;
     bool ended_ = false;
-    std::string readError_;
     int clockJumps_ = 0;
 
     int64_t clockShift_ = 0;     // media time added to stamps since the last jump of the source's clock

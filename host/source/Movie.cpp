@@ -6,11 +6,12 @@
 
 namespace movieconv {
 
-Movie::Movie(const std::string& path, SourceChoice choice) : source_(path, choice), demuxer_(source_) {
+Movie::Movie(const std::string& path, const SourceChoice& choice)
+    : source_(path, choice), failures_([this] { demuxer_.Stop(); }), demuxer_(source_, failures_) {
     if (source_.PictureStream() != nullptr)
-        pictures_ = std::make_unique<PictureDecoder>(source_, demuxer_);
+        pictures_ = std::make_unique<PictureDecoder>(source_, demuxer_, failures_);
     if (source_.SoundStream() != nullptr)
-        sound_ = std::make_unique<SoundDecoder>(source_, demuxer_);
+        sound_ = std::make_unique<SoundDecoder>(source_, demuxer_, failures_);
 }
 
 void Movie::EndPicturesAt(double seconds) {
@@ -27,19 +28,19 @@ void Movie::Stop() {
 }
 
 std::optional<Shortfall> Movie::Missing() const {
-    const auto reached = [&](const AVStream* stream) {
-        return ToSeconds(demuxer_.EndOf(stream->index).value_or(0));
-    };
+    const auto reached = [&](int stream) { return ToSeconds(demuxer_.EndOf(stream).value_or(0)); };
     Reached ends;
     if (pictures_ && pictures_->RanDry())
-        ends.pictures = reached(source_.PictureStream());
+        ends.pictures = reached(Info().pictures->index);
     if (sound_ && sound_->RanDry())
-        ends.sound = reached(source_.SoundStream());
+        ends.sound = reached(Info().sound->index);
     return FindShortfall(Info().promise, ends);
 }
 
 std::vector<std::string> Movie::Complaints() const {
     std::vector<std::string> texts;
+    if (!source_.LeftOut().empty())
+        texts.push_back(source_.LeftOut());
     if (const int jumps = demuxer_.ClockJumps(); jumps > 0) {
         texts.push_back(fmt::format("the source's clock jumped {}; the parts were joined",
                                     jumps == 1 ? "once" : fmt::format("{} times", jumps)));

@@ -3,6 +3,7 @@
 #define MOVIECONV_HOST_SOURCE_MOVIE_H
 
 #include "host/source/Demuxer.h"
+#include "host/source/Failures.h"
 #include "host/source/PictureDecoder.h"
 #include "host/source/SoundDecoder.h"
 #include "host/source/Source.h"
@@ -17,7 +18,7 @@ namespace movieconv {
 class Movie {
 public:
     /// Opens the movie and its decoders. Throws SourceError.
-    Movie(const std::string& path, SourceChoice choice);
+    Movie(const std::string& path, const SourceChoice& choice);
 
     const SourceInfo& Info() const { return source_.Info(); }
 
@@ -39,7 +40,7 @@ public:
     double SoundSeconds() const { return sound_ ? sound_->SecondsDelivered() : 0; }
 
     /// Why reading ended before the end of the source; empty when it did not. Any thread.
-    std::string ReadError() const { return demuxer_.ReadError(); }
+    std::string ReadError() const { return failures_.First(); }
 
     /// What the source promises and does not hold, of the streams that were taken to their end; nothing when
     /// it holds all. Once both streams ended.
@@ -51,6 +52,7 @@ public:
 
 private:
     Source source_;
+    Failures failures_;
     Demuxer demuxer_;
     std::unique_ptr<PictureDecoder> pictures_;
     std::unique_ptr<SoundDecoder> sound_;

@@ -11,42 +11,32 @@ namespace {
 constexpr std::size_t kPicturesAhead = 3;
 constexpr std::size_t kHeavyPicturesAhead = 1; // each of many decoding threads keeps a finished one as well
 constexpr std::size_t kBytesAhead = 256 << 20;
-constexpr int kWarmUpPictures = 4;
-constexpr int kFewestJudged = 8;
-constexpr int kMostJudged = 24;
-constexpr std::size_t kTrialPackets = 400;
-constexpr unsigned kMostThreads = 16;
-constexpr double kHeavy = 0.5; // bits in a pixel from which decoding is sure to be slower than encoding
-constexpr double kBusy = 0.85; // share of the processors from which more threads bring nothing
 
 std::size_t Bytes(const AVFrame& frame) {
     return static_cast<std::size_t>(frame.width) * static_cast<std::size_t>(frame.height) * 3 / 2;
 }
 
-/// For a decoder that is the slower side: more than processors, since they wait for each other.
-int ManyThreads() {
-    const unsigned processors = std::thread::hardware_concurrency();
-    return processors > 1 ? static_cast<int>(std::min(processors + 2, kMostThreads)) : 1;
-}
-
-/// Whether that is known beforehand: decoding takes its time for every bit, encoding for every pixel.
-bool IsHeavy(const Source& source) {
+/// Bits for a pixel of the coded stream; 0 when its rate is not told.
+double BitsPerPixel(const Source& source) {
     const PictureStreamInfo& pictures = *source.Info().pictures;
-    const double pixelRate = pictures.frameRate * pictures.width * pictures.height;
-    return static_cast<double>(source.PictureStream()->codecpar->bit_rate) > kHeavy * pixelRate;
+    return static_cast<double>(source.PictureStream()->codecpar->bit_rate) /
+           (pictures.frameRate * pictures.width * pictures.height);
 }
 
 } // namespace
 
-PictureDecoder::PictureDecoder(const Source& source, Demuxer& demuxer)
-    : source_(source),
+PictureDecoder::PictureDecoder(const Source& source, Demuxer& demuxer, Failures& failures)
+    : reader_(source.Reader()),
       demuxer_(demuxer),
-      stream_(source.PictureStream()),
-      trial_(IsHeavy(source) ? std::nullopt : std::make_optional<std::vector<av::Packet>>()),
-      decoder_(std::make_unique<StreamDecoder>(*stream_, trial_ ? 1 : ManyThreads())),
+      failures_(failures),
+      stream_(source.PictureStream()->index),
+      timeBase_(source.PictureStream()->time_base),
+      parameters_(CopyOf(*source.PictureStream()->codecpar)),
+      threads_(BitsPerPixel(source)),
+      decoder_(std::make_unique<StreamDecoder>(*parameters_, timeBase_, threads_.Count())),
       converter_(source.Info().pictures->quarterTurns, source.Info().pictures->mirrored),
       stamps_(ToMediaTime(1 / source.Info().pictures->frameRate)),
-      queue_(trial_ ? kPicturesAhead : kHeavyPicturesAhead, kBytesAhead,
+      queue_(threads_.OnTrial() ? kPicturesAhead : kHeavyPicturesAhead, kBytesAhead,
              {L"Movie::The picture decoder waits for the conversion",
               L"Movie::The conversion waits for the picture decoder"}) {
     const PictureStreamInfo& pictures = *source.Info().pictures;
@@ -75,7 +65,7 @@ void PictureDecoder::EndAt(double seconds) {
 VideoImage* PictureDecoder::GetCurrentImage() {
     if (!ended_ && !current_.frame) {
         ended_ =
-            !demuxer_.Attempt([this] { thread_ = std::thread(&PictureDecoder::Run, this); }) || !Advance();
+            !failures_.Attempt([this] { thread_ = std::thread(&PictureDecoder::Run, this); }) || !Advance();
     }
     return ended_ ? nullptr : &image_;
 }
@@ -109,7 +99,7 @@ bool PictureDecoder::Advance() {
 }
 
 void PictureDecoder::Run() {
-    demuxer_.Attempt([this] {
+    failures_.Attempt([this] {
         DecodeAll();
         if (const auto last = stamps_.Finish(); last && held_)
             Deliver(*last);
@@ -122,12 +112,14 @@ void PictureDecoder::Run() {
 
 void PictureDecoder::DecodeAll() {
     const auto accept = [this](AVFrame& frame) { return Accept(frame); };
-    use_ = {};
-    while (const av::Packet packet = demuxer_.Take(stream_->index)) {
+    threads_.Begin();
+    while (const av::Packet packet = demuxer_.Take(stream_)) {
         if (!decoder_->Decode(packet.get(), accept))
             return;
         damaged_ = damagedBefore_ + decoder_->Damaged();
-        if (!ConsiderMoreThreads(av::Packet(trial_ ? av_packet_clone(packet.get()) : nullptr)))
+        if (!threads_.OnTrial())
+            continue;
+        if (const auto known = threads_.Consider(*packet); known && !UseMoreThreads(*known))
             return;
     }
     decoder_->Decode(nullptr, accept);
@@ -141,7 +133,7 @@ bool PictureDecoder::Accept(AVFrame& frame) {
     ++decoded_;
     std::optional<int64_t> stamp;
     if (frame.best_effort_timestamp != AV_NOPTS_VALUE)
-        stamp = source_.MediaTime(frame.best_effort_timestamp, stream_);
+        stamp = reader_.MediaTime(frame.best_effort_timestamp, timeBase_);
     const auto previous = stamps_.Push(stamp);
     if (previous && !Deliver(*previous)) {
         held_.reset();
@@ -171,41 +163,16 @@ bool PictureDecoder::Deliver(StampRepair::Stamp stamp) {
         return true;
     }
     first_ = false;
-    if (++pushed_ == kWarmUpPictures)
-        use_ = {};
-    else if (pushed_ > kWarmUpPictures && queue_.Size() == 0)
-        ++starved_;
+    threads_.OnPicture(queue_.Size() == 0);
     const std::size_t bytes = Bytes(*picture);
     refused_ = !queue_.Push({std::move(picture), stamp}, bytes);
     return !refused_;
 }
 
-/// Unless the stream is heavy, one thread decodes at first. It costs the least and is mostly enough: the
-/// encoder is slower. When the queue keeps running empty, the decoder is the slower one and gets the other
-/// processors too, if the program leaves them idle: as soon as that is known, since all is decoded again.
-/// False when nobody takes pictures any more.
-bool PictureDecoder::ConsiderMoreThreads(av::Packet packet) {
-    if (!trial_)
-        return true;
-    if (!packet) { // no memory for its copy: the decoder stays as it is
-        trial_.reset();
-        return true;
-    }
-    trial_->push_back(std::move(packet));
-    const int judged = pushed_ - kWarmUpPictures;
-    const bool known = judged >= kFewestJudged || trial_->size() >= kTrialPackets;
-    const bool runsEmpty = judged <= 0 || starved_ * 2 > judged;
-    if (known && runsEmpty && use_.Processors() < kBusy * std::thread::hardware_concurrency())
-        return UseMoreThreads(*std::exchange(trial_, std::nullopt));
-    if (judged >= kMostJudged || trial_->size() >= kTrialPackets)
-        trial_.reset();
-    return true;
-}
-
 /// Begins again with more threads and skips the frames that are known, whatever lies between key pictures.
 bool PictureDecoder::UseMoreThreads(const std::vector<av::Packet>& known) {
     damagedBefore_ += decoder_->Damaged();
-    decoder_ = std::make_unique<StreamDecoder>(*stream_, ManyThreads());
+    decoder_ = std::make_unique<StreamDecoder>(*parameters_, timeBase_, DecodingThreads::Many());
     skip_ = decoded_;
     return std::all_of(known.begin(), known.end(), [this](const av::Packet& packet) {
         return decoder_->Decode(packet.get(), [this](AVFrame& frame) { return Accept(frame); });

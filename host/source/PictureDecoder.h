@@ -6,9 +6,10 @@
 #ifndef MOVIECONV_HOST_SOURCE_PICTUREDECODER_H
 #define MOVIECONV_HOST_SOURCE_PICTUREDECODER_H
 
+#include "host/source/DecodingThreads.h"
 #include "host/source/Demuxer.h"
+#include "host/source/Failures.h"
 #include "host/source/PictureConverter.h"
-#include "host/source/ProcessorUse.h"
 #include "host/source/StampRepair.h"
 #include "host/source/StreamDecoder.h"
 #include "media/Decoders.h"
@@ -26,7 +27,7 @@ class PictureDecoder final : public VideoDecoder {
 public:
     /// The first picture handed out is the one shown at the time that Seek asked for, stamped with that time;
     /// without Seek it is the movie's first, stamped with 0 if it comes later. Throws SourceError.
-    PictureDecoder(const Source& source, Demuxer& demuxer);
+    PictureDecoder(const Source& source, Demuxer& demuxer, Failures& failures);
     ~PictureDecoder();
 
     VideoSourceInfo* GetVideoInfo() override { return &info_; }
@@ -60,18 +61,19 @@ private:
     void DecodeAll();
     bool Accept(AVFrame& frame);
     bool Deliver(StampRepair::Stamp stamp);
-    bool ConsiderMoreThreads(av::Packet packet);
     bool UseMoreThreads(const std::vector<av::Packet>& known);
     bool Advance();
 
-    const Source& source_;
+    const MovieReader& reader_;
     Demuxer& demuxer_;
-    const AVStream* stream_;
+    Failures& failures_;
+    const int stream_;
+    const AVRational timeBase_;
     VideoSourceInfo info_{};
 
     // The decoding thread's.
-    std::optional<std::vector<av::Packet>>
-        trial_; // packets since the start, until the thread count is settled
+    const av::CodecParameters parameters_;
+    DecodingThreads threads_;
     std::unique_ptr<StreamDecoder> decoder_;
     PictureConverter converter_;
     StampRepair stamps_;
@@ -82,9 +84,6 @@ private:
     int64_t skip_ = 0; // frames that a restarted decoder gives once more
     bool first_ = true;
     bool refused_ = false; // nobody takes pictures any more
-    int pushed_ = 0;
-    int starved_ = 0;
-    ProcessorUse use_; // since the warm-up, of the decoding thread
     int64_t damagedBefore_ = 0;
 
     // Between the threads.

@@ -22,8 +22,8 @@ int BlockSamples(const SourceInfo& info) {
     return std::max(samples, kSmallestBlock);
 }
 
-AVSampleFormat OutputFormat(const SoundStreamInfo& sound) {
-    return sound.bitsPerSample == 32 ? AV_SAMPLE_FMT_S32 : AV_SAMPLE_FMT_S16;
+AVSampleFormat OutputFormat(const AudioFormat& sound) {
+    return sound.nBitsPerSample == 32 ? AV_SAMPLE_FMT_S32 : AV_SAMPLE_FMT_S16;
 }
 
 /// A layout with places for its channels: some sources tell only how many there are.
@@ -38,11 +38,13 @@ void CopyLayout(AVChannelLayout& target, const AVChannelLayout& source) {
 
 } // namespace
 
-SoundDecoder::SoundDecoder(const Source& source, Demuxer& demuxer)
-    : source_(source),
+SoundDecoder::SoundDecoder(const Source& source, Demuxer& demuxer, Failures& failures)
+    : reader_(source.Reader()),
       demuxer_(demuxer),
-      stream_(source.SoundStream()),
-      decoder_(*stream_, 1),
+      failures_(failures),
+      stream_(source.SoundStream()->index),
+      timeBase_(source.SoundStream()->time_base),
+      decoder_(*source.SoundStream()->codecpar, timeBase_, 1),
       inputForm_(av::NewFrame()),
       queue_(1 << 12,
              static_cast<std::size_t>(source.Info().sound->sampleRate) *
@@ -54,7 +56,7 @@ SoundDecoder::SoundDecoder(const Source& source, Demuxer& demuxer)
     blockBytes_ = BlockSamples(source.Info()) * frameBytes_;
     info_.format = {sound.sampleRate, sound.channels, sound.bitsPerSample,
                     static_cast<int32_t>(sound.sampleRate * frameBytes_), sound.duration};
-    CopyLayout(*outputLayout_.Get(), stream_->codecpar->ch_layout);
+    CopyLayout(*outputLayout_.Get(), source.SoundStream()->codecpar->ch_layout);
 }
 
 SoundDecoder::~SoundDecoder() {
@@ -78,7 +80,8 @@ double SoundDecoder::SecondsDelivered() const {
 }
 
 AudioFrame* SoundDecoder::GetNextFrame() {
-    if (!thread_.joinable() && !demuxer_.Attempt([this] { thread_ = std::thread(&SoundDecoder::Run, this); }))
+    if (!thread_.joinable() &&
+        !failures_.Attempt([this] { thread_ = std::thread(&SoundDecoder::Run, this); }))
         return nullptr;
     while (used_ == static_cast<int64_t>(current_.size())) {
         std::optional<Chunk> next = queue_.Pop();
@@ -109,7 +112,7 @@ AudioFrame* SoundDecoder::GetNextFrame() {
 
 void SoundDecoder::Run() {
     timeline_.emplace(info_.format.nSampleRate, begin_);
-    demuxer_.Attempt([this] { DecodeAll(); });
+    failures_.Attempt([this] { DecodeAll(); });
     ranDry_ = !refused_;
     corrections_ = timeline_->Corrections();
     queue_.Finish();
@@ -119,7 +122,12 @@ void SoundDecoder::DecodeAll() {
     const auto accept = [this](AVFrame& frame) { return Accept(frame); };
     bool goesOn = true;
     while (goesOn) {
-        const av::Packet packet = demuxer_.Take(stream_->index);
+        const auto taken = demuxer_.TakeOrSilence(stream_);
+        if (const int64_t* silentUntil = std::get_if<int64_t>(&taken)) {
+            goesOn = PushSilence(timeline_->FillTo(*silentUntil));
+            continue;
+        }
+        const av::Packet& packet = std::get<av::Packet>(taken);
         goesOn = decoder_.Decode(packet.get(), accept) && packet;
         if (begin_ > 0 && timeline_->Position() == 0)
             damagedBefore_ = decoder_.Damaged();
@@ -134,7 +142,7 @@ bool SoundDecoder::Accept(const AVFrame& frame) {
         return true;
     std::optional<int64_t> stamp;
     if (frame.best_effort_timestamp != AV_NOPTS_VALUE)
-        stamp = source_.MediaTime(frame.best_effort_timestamp, stream_);
+        stamp = reader_.MediaTime(frame.best_effort_timestamp, timeBase_);
     return PushPlaced(stamp, Resample(&frame));
 }
 
@@ -152,7 +160,7 @@ bool SoundDecoder::FitResampler(const AVFrame& frame) {
     CopyLayout(inputForm_->ch_layout, frame.ch_layout);
     SwrContext* resampler = resampler_.release();
     int result = swr_alloc_set_opts2(
-        &resampler, outputLayout_.Get(), OutputFormat(*source_.Info().sound), info_.format.nSampleRate,
+        &resampler, outputLayout_.Get(), OutputFormat(info_.format), info_.format.nSampleRate,
         &inputForm_->ch_layout, static_cast<AVSampleFormat>(frame.format), frame.sample_rate, 0, nullptr);
     resampler_.reset(resampler);
     if (result >= 0)

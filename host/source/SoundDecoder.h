@@ -5,6 +5,7 @@
 #define MOVIECONV_HOST_SOURCE_SOUNDDECODER_H
 
 #include "host/source/Demuxer.h"
+#include "host/source/Failures.h"
 #include "host/source/SoundTimeline.h"
 #include "host/source/StreamDecoder.h"
 #include "media/Decoders.h"
@@ -20,7 +21,7 @@ class SoundDecoder final : public AudioDecoder {
 public:
     /// The first sample handed out lies exactly at the time that Seek asked for, without Seek at the source's
     /// start: sound that begins later is preceded by silence. Throws SourceError.
-    SoundDecoder(const Source& source, Demuxer& demuxer);
+    SoundDecoder(const Source& source, Demuxer& demuxer, Failures& failures);
     ~SoundDecoder();
 
     AudioSourceInfo* GetAudioInfo() override { return &info_; }
@@ -50,9 +51,11 @@ private:
     bool PushSilence(int64_t samples);
     bool Push(Chunk chunk);
 
-    const Source& source_;
+    const MovieReader& reader_;
     Demuxer& demuxer_;
-    const AVStream* stream_;
+    Failures& failures_;
+    const int stream_;
+    const AVRational timeBase_;
     AudioSourceInfo info_{};
     int64_t frameBytes_ = 0; // of one sample of all channels
     int64_t blockBytes_ = 0;

@@ -24,6 +24,13 @@ SoundTimeline::Placement SoundTimeline::Place(std::optional<int64_t> stamp, int6
     return placement;
 }
 
+int64_t SoundTimeline::FillTo(int64_t time) {
+    const int64_t silence =
+        std::max<int64_t>(av_rescale(time - begin_, sampleRate_, kTicksPerSecond) - position_, 0);
+    position_ += silence;
+    return silence;
+}
+
 /// Whether a frame that lies `offset` samples ahead of the timeline's end really does.
 bool SoundTimeline::IsGap(int64_t offset) {
     constexpr int64_t kRoundingParts = 40; // of a second

@@ -24,6 +24,9 @@ public:
     /// Places a frame of so many samples with its stamp in media time, nothing when it has none.
     Placement Place(std::optional<int64_t> stamp, int64_t samples);
 
+    /// Samples of silence up to that media time, which it takes for placed. 0 when it is past.
+    int64_t FillTo(int64_t time);
+
     /// Samples on the timeline so far.
     int64_t Position() const { return position_; }
 

@@ -9,13 +9,17 @@
 
 namespace movieconv {
 
+/// Parameters that outlive their stream. Throws std::bad_alloc.
+av::CodecParameters CopyOf(const AVCodecParameters& parameters);
+
 class StreamDecoder {
 public:
     /// Takes a frame by moving its content out; false ends the decoding.
     using Sink = std::function<bool(AVFrame& frame)>;
 
-    /// Opens the decoder of `stream` with so many threads. Throws SourceError.
-    StreamDecoder(const AVStream& stream, int threads);
+    /// Opens the decoder of a stream with these parameters, whose packets' stamps count in `timeBase`, with
+    /// so many threads. Throws SourceError.
+    StreamDecoder(const AVCodecParameters& parameters, AVRational timeBase, int threads);
 
     /// Decodes one packet, or the rest when `packet` is null, and hands every frame to `sink`. Damaged data
     /// is skipped and counted. False when the sink ended it or everything has been decoded. Throws

@@ -1,6 +1,7 @@
 // What a source may make the program read besides itself.
 #include "host/source/Source.h"
 #include "tests/host/Inspect.h"
+#include "tests/host/Program.h"
 #include "tests/host/TestMovies.h"
 
 #include <gtest/gtest.h>
@@ -108,5 +109,29 @@ const Listed kLists[] = {
 };
 INSTANTIATE_TEST_SUITE_P(Lists, Playlists, testing::ValuesIn(kLists),
                          [](const auto& test) { return test.param.name; });
+
+TEST(Playlist, OfFragmentsIsReadFromAnyTimeOn) { // which its demultiplexer cannot seek in
+    const Folder folder;
+    const Args fragments{"-c:v",
+                         "mpeg4",
+                         "-g",
+                         "10",
+                         "-f",
+                         "hls",
+                         "-hls_time",
+                         "1",
+                         "-hls_segment_type",
+                         "fmp4",
+                         "-hls_list_size",
+                         "0",
+                         folder / "list.m3u8"};
+    ASSERT_EQ(program::Run(Join(Args{"ffmpeg", "-v", "error"}, CountedPictures(4), Beeps(4), fragments)).code,
+              0);
+    Movie movie(folder / "list.m3u8", {.playlists = true});
+    const inspect::Seen seen = inspect::TakeAll(movie, 2);
+    ASSERT_NEAR(static_cast<double>(seen.pictures.size()), 50, 1); // its clock begins with the sound
+    EXPECT_NEAR(seen.pictures.back().luma, LumaOf(99), 2);
+    EXPECT_EQ(movie.ReadError(), "");
+}
 
 } // namespace

@@ -1,0 +1,75 @@
+#include "host/source/MovieReader.h"
+
+#include "host/source/MediaTime.h"
+#include "host/source/SourceError.h"
+
+#include <algorithm>
+#include <utility>
+
+namespace movieconv {
+
+MovieReader::MovieReader(const std::string& path, bool playlists)
+    : path_(path), playlists_(playlists), file_(std::make_unique<MovieFile>(path, playlists)) {
+    if (const int64_t start = Context()->start_time; start != AV_NOPTS_VALUE)
+        start_ = av_rescale_q(start, {1, AV_TIME_BASE}, {1, kTicksPerSecond});
+}
+
+void MovieReader::Select(std::vector<int> streams) {
+    selected_ = std::move(streams);
+    for (unsigned i = 0; i < Context()->nb_streams; ++i) {
+        const bool wanted = std::count(selected_.begin(), selected_.end(), static_cast<int>(i)) > 0;
+        Context()->streams[i]->discard = wanted ? AVDISCARD_DEFAULT : AVDISCARD_ALL;
+    }
+}
+
+int64_t MovieReader::MediaTime(int64_t stamp, AVRational timeBase) const {
+    constexpr int64_t kFarthest = int64_t{1} << 60; // room for sums with what damaged stamps tell
+    return std::clamp(av_rescale_q(stamp, timeBase, {1, kTicksPerSecond}), -kFarthest, kFarthest) - start_;
+}
+
+bool MovieReader::IsSeekable() const {
+    return Context()->pb != nullptr && (Context()->pb->seekable & AVIO_SEEKABLE_NORMAL) != 0;
+}
+
+bool MovieReader::Rewind() {
+    if (file_->IsPlaylist()) { // whose demultiplexer may find nothing more after a seek, and tells success
+        try {
+            Reopen();
+            return true;
+        } catch (const SourceError&) {
+            return false;
+        }
+    }
+    const int flags = Context()->iformat->flags;
+    const auto toFirstByte = [&] {
+        return (flags & AVFMT_NO_BYTE_SEEK) == 0 &&
+               avformat_seek_file(Context(), -1, 0, 0, 0, AVSEEK_FLAG_BYTE) >= 0;
+    };
+    // In streams for broadcast the first time lies behind the first key picture, which is decoded earlier.
+    if ((flags & AVFMT_TS_DISCONT) != 0 && toFirstByte())
+        return true;
+    // By the stream that begins first, lest the others be skipped up to where the usual one begins.
+    const AVStream* first = nullptr;
+    const auto begin = [&](const AVStream* stream) {
+        return stream->start_time != AV_NOPTS_VALUE ? MediaTime(stream->start_time, stream->time_base) : 0;
+    };
+    for (const int index : selected_) {
+        const AVStream* stream = Context()->streams[index];
+        if (first == nullptr || begin(stream) < begin(first))
+            first = stream;
+    }
+    const int64_t start = first->start_time != AV_NOPTS_VALUE ? first->start_time : 0;
+    const int64_t earlier = start - av_rescale_q(1, {1, 1}, first->time_base);
+    return avformat_seek_file(Context(), first->index, INT64_MIN, earlier, start, 0) >= 0 || toFirstByte();
+}
+
+void MovieReader::Reopen() {
+    auto again = std::make_unique<MovieFile>(path_, playlists_);
+    const int last = selected_.empty() ? -1 : *std::max_element(selected_.begin(), selected_.end());
+    if (last >= static_cast<int>(again->Context()->nb_streams))
+        throw SourceError("\"" + path_ + "\" has changed meanwhile");
+    file_ = std::move(again);
+    Select(std::move(selected_));
+}
+
+} // namespace movieconv

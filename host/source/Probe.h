@@ -1,0 +1,21 @@
+// Finds out what a container does not tell reliably: how many pictures there are in a second, how long the
+// movie is. What it has to read for that, it reads again later: the reader is at its start afterwards.
+#ifndef MOVIECONV_HOST_SOURCE_PROBE_H
+#define MOVIECONV_HOST_SOURCE_PROBE_H
+
+#include "host/source/MovieReader.h"
+#include "host/source/SourceInfo.h"
+
+namespace movieconv {
+
+/// Fills in the chosen pictures' rates. Throws SourceError when the source cannot be read from its start
+/// again.
+void ProbeFrameRate(MovieReader& reader, SourceInfo& info);
+
+/// Fills in the lengths of the movie and of the chosen streams, how certain they are, and what the container
+/// promises. Throws SourceError likewise.
+void ProbeLength(MovieReader& reader, SourceInfo& info);
+
+} // namespace movieconv
+
+#endif

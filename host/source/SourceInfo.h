@@ -1,0 +1,142 @@
+// What a movie holds, as its container and its first packets tell.
+#ifndef MOVIECONV_HOST_SOURCE_SOURCEINFO_H
+#define MOVIECONV_HOST_SOURCE_SOURCEINFO_H
+
+#include "host/source/Completeness.h"
+
+#include <cstdint>
+#include <optional>
+#include <string>
+#include <vector>
+
+extern "C" {
+#include <libavutil/rational.h>
+}
+
+namespace movieconv {
+
+/// How a duration was found: told by the source, reckoned from its size and parts of it, or not at all.
+enum class Certainty { kKnown, kEstimated, kGuessed };
+
+enum class StreamKind { kPictures, kSound, kSubtitles, kCover, kAttachment, kData };
+
+struct Tag {
+    std::string key; ///< As FFmpeg calls it, "title"; others as the container has them.
+    std::string value;
+};
+
+/// The display that the pictures were made for: chromaticities as in CIE 1931, luminances in cd/m².
+struct MasteringDisplay {
+    double red[2]{}; ///< x, y
+    double green[2]{};
+    double blue[2]{};
+    double white[2]{};
+    double darkest = 0;
+    double brightest = 0;
+};
+
+struct LightLevel {
+    int brightestPixel = 0;   ///< cd/m² of the brightest pixel of all pictures.
+    int brightestPicture = 0; ///< cd/m², the highest average of a picture.
+};
+
+struct PictureStreamInfo {
+    int index = -1;          ///< Stream number in the container.
+    std::string codec;       ///< Codec name, "h264".
+    std::string pixelFormat; ///< FFmpeg's name, "yuv420p".
+    int depth = 8;           ///< Bits of a component.
+    int width = 0;           ///< As shown, after rotation.
+    int height = 0;
+    int quarterTurns = 0;  ///< Clockwise turns by 90 degrees that bring the stored picture upright.
+    bool mirrored = false; ///< The stored picture is mirrored left to right before it is turned.
+    AVRational
+        pixelAspect{};    ///< Shape of a pixel as shown, width to height; 1:1 when the source does not tell.
+    double frameRate = 0; ///< Average pictures per second; 0 when the container tells none.
+    double peakRate = 0;  ///< Pictures per second where they follow each other closest; at least the average.
+    double duration = 0;  ///< Seconds; estimated when the container does not tell.
+    bool interlaced = false;
+    bool topFieldFirst = false;
+    bool fullRange = false;
+    int colorPrimaries = 2; ///< As in ISO/IEC 23091-2; 2: not stated.
+    int colorTransfer = 2;
+    int colorMatrix = 2;
+    std::optional<MasteringDisplay> masteringDisplay;
+    std::optional<LightLevel> lightLevel;
+    bool dolbyVision = false;
+};
+
+struct SoundStreamInfo {
+    int index = -1;
+    std::string codec;
+    std::string layout; ///< "stereo", "5.1".
+    int sampleRate = 0;
+    int channels = 0;
+    int bitsPerSample = 16; ///< Of the PCM handed out: 16, or 32 for sources that hold more than 16.
+    double duration = 0;
+};
+
+/// What a stream's author says that it is for.
+struct StreamFlags {
+    bool isDefault = false;
+    bool forced = false;
+    bool original = false;
+    bool dub = false;
+    bool commentary = false;
+    bool hearingImpaired = false;
+    bool visualImpaired = false;
+};
+
+struct StreamInfo {
+    int index = -1; ///< Number in the container.
+    StreamKind kind = StreamKind::kData;
+    std::string codec;
+    std::string profile;  ///< Of the codec, "High"; empty when it is not known.
+    std::string language; ///< As the container has it, mostly ISO 639-2; empty when it is undetermined.
+    std::string title;
+    StreamFlags flags;
+    bool decodable = false;
+    std::optional<double> begin; ///< Seconds from the start of the source.
+    double duration = 0;         ///< Seconds to its end; 0 when the container does not tell.
+    int64_t bitRate = 0;         ///< Bits per second; 0 when it is not told.
+    std::vector<int> programs;   ///< Numbers of the broadcast programmes that it belongs to.
+    std::vector<Tag> tags;       ///< What people wrote about it, but for language and title.
+
+    std::optional<PictureStreamInfo> pictures; ///< Of pictures and covers.
+    std::optional<SoundStreamInfo> sound;
+    bool textual = false; ///< Subtitles made of text, not of bitmaps.
+    std::string fileName; ///< Of attachments and covers.
+    std::string mimeType;
+    int64_t bytes = 0; ///< Size of attachments and covers.
+};
+
+struct Chapter {
+    double begin = 0; ///< Seconds from the start of the source.
+    double end = 0;
+    std::string title;
+    std::vector<Tag> tags; ///< But for the title.
+};
+
+struct SourceInfo {
+    std::string path;
+    std::string container;                   ///< FFmpeg's long name.
+    int64_t bytes = 0;                       ///< Size of the file, 0 when it has none.
+    double duration = 0;                     ///< Seconds; the longer of the converted streams'.
+    Certainty certainty = Certainty::kKnown; ///< Of `duration`.
+    std::vector<StreamInfo> streams;         ///< All of them, in the container's order.
+    std::vector<Chapter> chapters;
+    std::vector<Tag> tags; ///< What people wrote about the movie.
+
+    std::optional<PictureStreamInfo> pictures; ///< The stream that is converted, probed.
+    std::optional<SoundStreamInfo> sound;
+    Promise promise; ///< Of these two.
+};
+
+struct SourceChoice {
+    bool pictures = true;   ///< Look for pictures at all.
+    bool sound = true;      ///< Look for sound at all.
+    bool playlists = false; ///< Also open what names other movies, in its own folder and below.
+};
+
+} // namespace movieconv
+
+#endif

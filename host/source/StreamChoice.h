@@ -1,0 +1,30 @@
+// Which of a movie's streams are converted.
+#ifndef MOVIECONV_HOST_SOURCE_STREAMCHOICE_H
+#define MOVIECONV_HOST_SOURCE_STREAMCHOICE_H
+
+#include "host/source/SourceInfo.h"
+
+#include <string>
+#include <vector>
+
+namespace movieconv {
+
+/// Stream numbers, -1 for none.
+struct ChosenStreams {
+    int pictures = -1;
+    int sound = -1;
+};
+
+/// The pictures are those marked as default, of several the largest, of several the first. The sound belongs
+/// to the same broadcast programme, is no commentary and not made for people who see or hear little, if there
+/// is another; then as for pictures, with channels for size. Only what can be decoded.
+ChosenStreams ChooseStreams(const std::vector<StreamInfo>& streams, const SourceChoice& choice);
+
+/// Which pictures and sound of the kinds asked for are not converted, in a sentence that says what is
+/// instead; empty when none is left out.
+std::string TellLeftOut(const std::vector<StreamInfo>& streams, const SourceChoice& choice,
+                        const ChosenStreams& chosen);
+
+} // namespace movieconv
+
+#endif

@@ -1,0 +1,253 @@
+#include "host/source/StreamDescription.h"
+
+#include "host/source/MediaTime.h"
+
+#include <algorithm>
+#include <array>
+#include <cmath>
+#include <string_view>
+
+extern "C" {
+#include <libavutil/avstring.h>
+#include <libavutil/display.h>
+#include <libavutil/mastering_display_metadata.h>
+#include <libavutil/pixdesc.h>
+}
+
+namespace movieconv {
+namespace {
+
+// A multiplexer's notes about its own file, and what is described in fields of its own.
+constexpr std::array<std::string_view, 13> kNotes{
+    "encoder",  "major_brand", "minor_version", "compatible_brands", "handler_name", "vendor_id", "duration",
+    "language", "filename",    "mimetype",      "variant_bitrate",   "id3v2_priv",   "rotate"};
+constexpr std::array<std::string_view, 4> kStatistics{"BPS", "NUMBER_OF_FRAMES", "NUMBER_OF_BYTES",
+                                                      "_STATISTICS_"};
+
+bool IsNote(const std::string& key) {
+    const auto same = [&](std::string_view note) { return av_strcasecmp(key.c_str(), note.data()) == 0; };
+    const auto begins = [&](std::string_view note) { return key.compare(0, note.size(), note) == 0; };
+    return std::any_of(kNotes.begin(), kNotes.end(), same) ||
+           std::any_of(kStatistics.begin(), kStatistics.end(), begins);
+}
+
+std::string TagOf(const AVDictionary* metadata, const char* key) {
+    const AVDictionaryEntry* entry = av_dict_get(metadata, key, nullptr, 0);
+    return entry != nullptr ? entry->value : "";
+}
+
+std::vector<Tag> TagsWithout(const AVDictionary* metadata, std::string_view left) {
+    std::vector<Tag> tags = DescribeTags(metadata);
+    tags.erase(
+        std::remove_if(tags.begin(), tags.end(),
+                       [&](const Tag& tag) { return av_strcasecmp(tag.key.c_str(), left.data()) == 0; }),
+        tags.end());
+    return tags;
+}
+
+bool IsUsual(AVRational rate) {
+    constexpr double kUsualFrameRate = 200; // a higher one may be an artefact of the container's clock
+    return rate.num > 0 && rate.den > 0 && av_q2d(rate) <= kUsualFrameRate;
+}
+
+/// Pictures per second by the container's word: the average rate, or its nominal one where they agree. 0 when
+/// neither is usual.
+double ToldFrameRate(const AVStream* stream) {
+    const AVRational average = stream->avg_frame_rate;
+    const AVRational nominal = stream->r_frame_rate;
+    if (IsUsual(average))
+        return av_q2d(IsUsual(nominal) && std::abs(av_q2d(nominal) / av_q2d(average) - 1) < 0.01 ? nominal
+                                                                                                 : average);
+    return IsUsual(nominal) ? av_q2d(nominal) : 0;
+}
+
+/// Reads the turn that brings the stored picture upright from the container's display matrix.
+void ReadOrientation(const AVStream* stream, PictureStreamInfo& info) {
+    const uint8_t* data = av_stream_get_side_data(stream, AV_PKT_DATA_DISPLAYMATRIX, nullptr);
+    if (data == nullptr)
+        return;
+    int32_t matrix[9];
+    std::copy_n(data, sizeof matrix, reinterpret_cast<uint8_t*>(matrix));
+    const int64_t determinant =
+        static_cast<int64_t>(matrix[0]) * matrix[4] - static_cast<int64_t>(matrix[1]) * matrix[3];
+    info.mirrored = determinant < 0;
+    if (info.mirrored)
+        av_display_matrix_flip(matrix, 1, 0);
+    const double counterClockwise = av_display_rotation_get(matrix);
+    if (!std::isnan(counterClockwise)) {
+        const int turns = static_cast<int>((std::lround(-counterClockwise / 90) % 4 + 4) % 4);
+        // The matrix mirrors last, the converter first: the turn changes its direction.
+        info.quarterTurns = info.mirrored ? (4 - turns) % 4 : turns;
+    }
+}
+
+AVRational PixelAspect(AVFormatContext& context, AVStream* stream, bool turned) {
+    AVRational aspect = av_guess_sample_aspect_ratio(&context, stream, nullptr);
+    if (aspect.num <= 0 || aspect.den <= 0)
+        return {1, 1};
+    return turned ? av_inv_q(aspect) : aspect;
+}
+
+void ReadLight(const AVStream* stream, PictureStreamInfo& info) {
+    const auto sideData = [&](AVPacketSideDataType type) {
+        return av_stream_get_side_data(stream, type, nullptr);
+    };
+    if (const auto* display = reinterpret_cast<const AVMasteringDisplayMetadata*>(
+            sideData(AV_PKT_DATA_MASTERING_DISPLAY_METADATA))) {
+        MasteringDisplay& told = info.masteringDisplay.emplace();
+        for (int axis = 0; axis < 2; ++axis) {
+            told.red[axis] = av_q2d(display->display_primaries[0][axis]);
+            told.green[axis] = av_q2d(display->display_primaries[1][axis]);
+            told.blue[axis] = av_q2d(display->display_primaries[2][axis]);
+            told.white[axis] = av_q2d(display->white_point[axis]);
+        }
+        told.darkest = av_q2d(display->min_luminance);
+        told.brightest = av_q2d(display->max_luminance);
+    }
+    if (const auto* light =
+            reinterpret_cast<const AVContentLightMetadata*>(sideData(AV_PKT_DATA_CONTENT_LIGHT_LEVEL)))
+        info.lightLevel = {static_cast<int>(light->MaxCLL), static_cast<int>(light->MaxFALL)};
+    info.dolbyVision = sideData(AV_PKT_DATA_DOVI_CONF) != nullptr;
+}
+
+PictureStreamInfo DescribePictures(AVFormatContext& context, AVStream* stream) {
+    const AVCodecParameters& parameters = *stream->codecpar;
+    PictureStreamInfo info;
+    info.index = stream->index;
+    info.codec = avcodec_get_name(parameters.codec_id);
+    if (const AVPixFmtDescriptor* format =
+            av_pix_fmt_desc_get(static_cast<AVPixelFormat>(parameters.format))) {
+        info.pixelFormat = format->name;
+        info.depth = format->comp[0].depth;
+    } else {
+        info.pixelFormat = "unknown";
+    }
+    ReadOrientation(stream, info);
+    const bool turned = info.quarterTurns % 2 != 0;
+    info.width = turned ? parameters.height : parameters.width;
+    info.height = turned ? parameters.width : parameters.height;
+    info.pixelAspect = PixelAspect(context, stream, turned);
+    info.frameRate = ToldFrameRate(stream);
+    info.interlaced = parameters.field_order > AV_FIELD_PROGRESSIVE;
+    info.topFieldFirst = parameters.field_order == AV_FIELD_TT || parameters.field_order == AV_FIELD_BT;
+    info.fullRange = parameters.color_range == AVCOL_RANGE_JPEG;
+    info.colorPrimaries = parameters.color_primaries;
+    info.colorTransfer = parameters.color_trc;
+    info.colorMatrix = parameters.color_space;
+    ReadLight(stream, info);
+    return info;
+}
+
+SoundStreamInfo DescribeSound(const AVStream* stream) {
+    const AVCodecParameters& parameters = *stream->codecpar;
+    SoundStreamInfo info;
+    info.index = stream->index;
+    info.codec = avcodec_get_name(parameters.codec_id);
+    char layout[64] = "";
+    av_channel_layout_describe(&parameters.ch_layout, layout, sizeof layout);
+    info.layout = layout;
+    info.sampleRate = parameters.sample_rate;
+    info.channels = parameters.ch_layout.nb_channels;
+    const int storedBits =
+        std::max(parameters.bits_per_raw_sample, av_get_exact_bits_per_sample(parameters.codec_id));
+    info.bitsPerSample = storedBits > 16 ? 32 : 16;
+    return info;
+}
+
+StreamKind KindOf(const AVStream* stream) {
+    const AVMediaType type = stream->codecpar->codec_type;
+    if (type == AVMEDIA_TYPE_VIDEO)
+        return (stream->disposition & AV_DISPOSITION_ATTACHED_PIC) != 0 ? StreamKind::kCover
+                                                                        : StreamKind::kPictures;
+    return type == AVMEDIA_TYPE_AUDIO        ? StreamKind::kSound
+           : type == AVMEDIA_TYPE_SUBTITLE   ? StreamKind::kSubtitles
+           : type == AVMEDIA_TYPE_ATTACHMENT ? StreamKind::kAttachment
+                                             : StreamKind::kData;
+}
+
+StreamFlags FlagsOf(const AVStream* stream) {
+    const auto has = [&](int flag) { return (stream->disposition & flag) != 0; };
+    return {has(AV_DISPOSITION_DEFAULT),        has(AV_DISPOSITION_FORCED),
+            has(AV_DISPOSITION_ORIGINAL),       has(AV_DISPOSITION_DUB),
+            has(AV_DISPOSITION_COMMENT),        has(AV_DISPOSITION_HEARING_IMPAIRED),
+            has(AV_DISPOSITION_VISUAL_IMPAIRED)};
+}
+
+/// A stamp in seconds from `start`.
+double SecondsFrom(int64_t start, int64_t stamp, AVRational timeBase) {
+    return ToSeconds(av_rescale_q(stamp, timeBase, {1, kTicksPerSecond}) - start);
+}
+
+StreamInfo DescribeStream(AVFormatContext& context, AVStream* stream, int64_t start) {
+    const AVCodecParameters& parameters = *stream->codecpar;
+    StreamInfo info;
+    info.index = stream->index;
+    info.kind = KindOf(stream);
+    info.codec = avcodec_get_name(parameters.codec_id);
+    if (const char* profile = avcodec_profile_name(parameters.codec_id, parameters.profile))
+        info.profile = profile;
+    info.language = TagOf(stream->metadata, "language");
+    if (info.language == "und")
+        info.language.clear();
+    info.title = TagOf(stream->metadata, "title");
+    info.flags = FlagsOf(stream);
+    info.decodable = avcodec_find_decoder(parameters.codec_id) != nullptr;
+    if (stream->start_time != AV_NOPTS_VALUE)
+        info.begin = SecondsFrom(start, stream->start_time, stream->time_base);
+    if (stream->duration > 0)
+        info.duration =
+            info.begin.value_or(0) + static_cast<double>(stream->duration) * av_q2d(stream->time_base);
+    info.bitRate = parameters.bit_rate;
+    info.tags = TagsWithout(stream->metadata, "title");
+    info.fileName = TagOf(stream->metadata, "filename");
+    info.mimeType = TagOf(stream->metadata, "mimetype");
+    info.bytes = info.kind == StreamKind::kCover        ? stream->attached_pic.size
+                 : info.kind == StreamKind::kAttachment ? parameters.extradata_size
+                                                        : 0;
+    const AVCodecDescriptor* codec = avcodec_descriptor_get(parameters.codec_id);
+    info.textual = codec != nullptr && (codec->props & AV_CODEC_PROP_TEXT_SUB) != 0;
+    if (parameters.codec_type == AVMEDIA_TYPE_VIDEO) {
+        info.pictures = DescribePictures(context, stream);
+        info.pictures->duration = info.duration;
+    } else if (parameters.codec_type == AVMEDIA_TYPE_AUDIO) {
+        info.sound = DescribeSound(stream);
+        info.sound->duration = info.duration;
+    }
+    return info;
+}
+
+} // namespace
+
+std::vector<StreamInfo> DescribeStreams(AVFormatContext& context, int64_t start) {
+    std::vector<StreamInfo> streams;
+    for (unsigned i = 0; i < context.nb_streams; ++i)
+        streams.push_back(DescribeStream(context, context.streams[i], start));
+    for (unsigned i = 0; i < context.nb_programs; ++i) {
+        const AVProgram& program = *context.programs[i];
+        for (unsigned k = 0; k < program.nb_stream_indexes; ++k)
+            streams[program.stream_index[k]].programs.push_back(program.id);
+    }
+    return streams;
+}
+
+std::vector<Chapter> DescribeChapters(const AVFormatContext& context, int64_t start) {
+    std::vector<Chapter> chapters;
+    for (unsigned i = 0; i < context.nb_chapters; ++i) {
+        const AVChapter& chapter = *context.chapters[i];
+        chapters.push_back({SecondsFrom(start, chapter.start, chapter.time_base),
+                            SecondsFrom(start, chapter.end, chapter.time_base),
+                            TagOf(chapter.metadata, "title"), TagsWithout(chapter.metadata, "title")});
+    }
+    return chapters;
+}
+
+std::vector<Tag> DescribeTags(const AVDictionary* metadata) {
+    std::vector<Tag> tags;
+    const AVDictionaryEntry* entry = nullptr;
+    while ((entry = av_dict_get(metadata, "", entry, AV_DICT_IGNORE_SUFFIX)) != nullptr)
+        if (!IsNote(entry->key))
+            tags.push_back({entry->key, entry->value});
+    return tags;
+}
+
+} // namespace movieconv

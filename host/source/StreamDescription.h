@@ -1,0 +1,21 @@
+// Describes a container's streams, chapters and tags.
+#ifndef MOVIECONV_HOST_SOURCE_STREAMDESCRIPTION_H
+#define MOVIECONV_HOST_SOURCE_STREAMDESCRIPTION_H
+
+#include "ffmpeg/AvHandles.h"
+#include "host/source/SourceInfo.h"
+
+#include <vector>
+
+namespace movieconv {
+
+/// All times count from `start`, in media time. Nothing is read; what only decoding would tell is left out.
+std::vector<StreamInfo> DescribeStreams(AVFormatContext& context, int64_t start);
+std::vector<Chapter> DescribeChapters(const AVFormatContext& context, int64_t start);
+
+/// What people wrote: nothing that a multiplexer notes about its own file.
+std::vector<Tag> DescribeTags(const AVDictionary* metadata);
+
+} // namespace movieconv
+
+#endif
