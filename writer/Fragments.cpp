@@ -69,21 +69,6 @@ Box ReadBox(ByteFile& file, int64_t position) {
     return box.size < static_cast<int64_t>(header.size()) ? Box{} : box;
 }
 
-/// How far `part` consists of whole fragments.
-int64_t WholeSize(ByteFile& part, int64_t end) {
-    int64_t whole = 0;
-    for (int64_t position = 0; position < end;) {
-        const Box box = ReadBox(part, position);
-        if (box.size == 0 || box.size > end - position)
-            break;
-        position += box.size;
-        // A fragment is a description followed by its data; the file's own description is whole by itself.
-        if (std::memcmp(box.type.data(), "moof", 4) != 0)
-            whole = position;
-    }
-    return whole;
-}
-
 [[noreturn]] void ThrowIncomplete() {
     throw WriterFailure(kWriterErrorFinish, "The temporary file does not hold all that was written.");
 }
@@ -92,9 +77,8 @@ int64_t WholeSize(ByteFile& part, int64_t end) {
 
 void JoinFragments(const std::shared_ptr<ByteFile>& part, const Muxer& written, const Container& container,
                    AvioFile& out, bool bitExact, const std::function<void(double)>& progress) {
-    // The multiplexer does not tell of data that it had no memory for.
     const int64_t end = part->Seek(0, SEEK_END);
-    if (WholeSize(*part, end) != end)
+    if (WholeFragments(*part, end) != end)
         ThrowIncomplete();
     AvioFile file(part, AvioFile::Mode::kRead);
     const av::Input input = OpenMovie(file, kWriterErrorFinish);
@@ -132,6 +116,20 @@ void CheckIndex(const std::shared_ptr<ByteFile>& file, const Muxer& written) {
             input->streams[stream]->nb_frames < written.Stream(stream).packets)
             throw WriterFailure(kWriterErrorEncode, "The index is not whole.");
     }
+}
+
+int64_t WholeFragments(ByteFile& part, int64_t size) {
+    int64_t whole = 0;
+    for (int64_t position = 0; position < size;) {
+        const Box box = ReadBox(part, position);
+        if (box.size == 0 || box.size > size - position)
+            break;
+        position += box.size;
+        // A fragment is a description followed by its data; the file's own description is whole by itself.
+        if (std::memcmp(box.type.data(), "moof", 4) != 0)
+            whole = position;
+    }
+    return whole;
 }
 
 } // namespace writer

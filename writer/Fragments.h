@@ -20,6 +20,10 @@ void JoinFragments(const std::shared_ptr<ByteFile>& part, const Muxer& written, 
 /// leaves out without a word what it has no memory for.
 void CheckIndex(const std::shared_ptr<ByteFile>& file, const Muxer& written);
 
+/// How far `part`, which has `size` bytes, consists of whole fragments. The multiplexer does not know: of
+/// data that it had no memory for it does not tell.
+int64_t WholeFragments(ByteFile& part, int64_t size);
+
 } // namespace writer
 
 #endif

@@ -1,6 +1,7 @@
 #include "writer/PartFile.h"
 
 #include "text/Path.h"
+#include "writer/Fragments.h"
 #include "writer/WriterFailure.h"
 #include "writer/WriterStatus.h"
 
@@ -11,7 +12,7 @@ namespace writer {
 
 PartFile::PartFile(const std::string& target, const FilePlan& plan, std::shared_ptr<FileRecord> record,
                    FileSystem& files)
-    : record_(std::move(record)), files_(files) {
+    : fragmented_(plan.Fragmented()), record_(std::move(record)), files_(files) {
     int error = 0;
     std::unique_ptr<ByteFile> file = CreateBeside(files_, target, ".part", path_, error);
     if (!file)
@@ -50,7 +51,7 @@ void PartFile::WriteTrailer() {
 void PartFile::CutToWhole() {
     io_->Flush();
     const int64_t size = io_->Size();
-    const int64_t whole = muxer_->WholeSize(size);
+    const int64_t whole = fragmented_ ? WholeFragments(*File(), size) : muxer_->WholeSize(size);
     const bool cut = whole < size && File()->Truncate(whole) >= 0;
     record_->Update([&](WriterStatus& status) { status.llBytesWritten = cut ? whole : size; });
 }

@@ -57,6 +57,7 @@ public:
     bool Broken() const { return io_->Error() != 0; }
 
 private:
+    const bool fragmented_;
     const std::shared_ptr<FileRecord> record_;
     FileSystem& files_;
     std::string path_;
