@@ -1,18 +1,24 @@
 /// \file
-/// The interface of MovieConv, the one header that a host includes.
+/// The interface of MovieConv, the header that a host includes.
 ///
-/// A converter takes the pictures and the sound of one opened movie from two decoders of the host, puts both
-/// on one timeline and has the media writer make a file of them, or a series of clips, on a worker thread of
-/// its own:
+/// A converter takes the pictures and the sound of one movie from the host, puts both on one timeline and has
+/// the media writer make a file of them, or a series of clips, on a worker thread of its own:
 ///
-///     MCHandle converter = MCCreate(video, audio);
+///     MCHandle converter = MCCreateFromSources(&video, &audio);
+///     MCEncodeParamForFile(L"/tmp/out.mp4", &param);
+///     MCSetEncodeParam(converter, &param);
 ///     MCSetOutputFile(converter, L"/tmp/out.mp4");
 ///     MCStart(converter, 0.0, 0.0, NULL, callback, context);
 ///     MCWait(converter, MC_INFINITE);
+///     MCGetResult(converter, &result);
 ///     MCDestroy(converter);
 ///
-/// The MC functions are C. Behind them follows what only C++ can use: the decoders that a host derives its
-/// own from, helpers, and the colour routines.
+/// The pictures and the sound come from tables of functions (MCVideoSource, MCAudioSource) or, in C++, from
+/// decoder objects that a host derives from VideoDecoder and AudioDecoder.
+///
+/// The events of the main queue (platform/Platform.h), the colour routines (Common/Image/ImageConvert.h),
+/// helpers for sound (engine/AudioHelpers.h), the media writer (writer/WriterStatus.h) and the log sink
+/// (logsink/LogSink.h) have headers of their own.
 ///
 /// Threads. A converter belongs to the host's thread that made it. MCPause, MCResume, MCAbort, MCStop,
 /// MCWait, MCEnablePreview, MCGetEncodeParam and the MCGet... queries may be called from any thread and at
@@ -35,7 +41,7 @@
 #include "media/MediaRecords.h"
 #include "media/ProgressCallback.h"
 #include "media/Sources.h"
-#include "platform/Platform.h"
+#include "platform/Window.h"
 
 #include <wchar.h>
 
@@ -205,12 +211,6 @@ int MCGetTargetFileName(MCHandle converter, wchar_t* buffer, int index);
 
 #ifdef __cplusplus
 } // extern "C"
-
-// ---- C++ only
-
-#include "Common/Image/ImageConvert.h"
-#include "engine/AudioHelpers.h"
-#include "engine/PostMessage.h"
 #endif
 
 #endif

@@ -11,31 +11,14 @@ endif()
 include(CMakePackageConfigHelpers)
 
 set(home_dir ${CMAKE_INSTALL_LIBDIR}/movieconv)
-set(header_dir ${CMAKE_INSTALL_INCLUDEDIR}/movieconv)
 set(doc_dir ${CMAKE_INSTALL_DATAROOTDIR}/doc/movieconv)
 set(package_dir ${CMAKE_INSTALL_LIBDIR}/cmake/MovieConv)
 
-# api/MovieConv.h with what it includes, and what a host may include beside it.
-target_sources(movieconv PUBLIC FILE_SET HEADERS BASE_DIRS ${PROJECT_SOURCE_DIR} FILES
-  ${PROJECT_SOURCE_DIR}/Common/Image/ImageConvert.h
-  ${PROJECT_SOURCE_DIR}/api/MovieConv.h
-  ${PROJECT_SOURCE_DIR}/engine/AudioHelpers.h
-  ${PROJECT_SOURCE_DIR}/engine/PostMessage.h
-  ${PROJECT_SOURCE_DIR}/engine/ProgressInfo.h
-  ${PROJECT_SOURCE_DIR}/logsink/LogSink.h
-  ${PROJECT_SOURCE_DIR}/media/Decoders.h
-  ${PROJECT_SOURCE_DIR}/media/EncodeParam.h
-  ${PROJECT_SOURCE_DIR}/media/FourCC.h
-  ${PROJECT_SOURCE_DIR}/media/MediaRecords.h
-  ${PROJECT_SOURCE_DIR}/media/MediaWriter.h
-  ${PROJECT_SOURCE_DIR}/media/ProgressCallback.h
-  ${PROJECT_SOURCE_DIR}/platform/Platform.h
-  ${PROJECT_SOURCE_DIR}/thread/TimeData.h
-  ${PROJECT_SOURCE_DIR}/writer/WriterStatus.h)
+include(cmake/headers.cmake)
+install(DIRECTORY ${public_header_dir} DESTINATION ${CMAKE_INSTALL_INCLUDEDIR})
+target_include_directories(movieconv INTERFACE $<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}>)
 
-install(TARGETS movieconv platform orvex quennet EXPORT MovieConvTargets
-  LIBRARY DESTINATION ${home_dir}
-  FILE_SET HEADERS DESTINATION ${header_dir})
+install(TARGETS movieconv platform orvex quennet EXPORT MovieConvTargets LIBRARY DESTINATION ${home_dir})
 install(TARGETS movieconv_host RUNTIME DESTINATION ${home_dir})
 
 # install_link(FOLDER NAME TARGET): a link NAME in FOLDER to TARGET, both of the installed tree.
@@ -51,8 +34,8 @@ install_link(${CMAKE_INSTALL_LIBDIR} libmovieconv.so.${PROJECT_VERSION_MAJOR}
 install_link(${CMAKE_INSTALL_LIBDIR} libmovieconv.so ${home_dir}/libmovieconv.so)
 
 install(FILES host/terminal/movieconv.1 DESTINATION ${CMAKE_INSTALL_MANDIR}/man1)
-install(FILES README.md CHANGELOG.md DESTINATION ${doc_dir})
-install(DIRECTORY docs DESTINATION ${doc_dir})
+include(cmake/documents.cmake)
+install(DIRECTORY ${document_dir}/ DESTINATION ${doc_dir})
 install(FILES LICENSE DESTINATION ${doc_dir} RENAME copyright)
 install(DIRECTORY examples/ DESTINATION ${doc_dir}/examples)
 
@@ -64,12 +47,14 @@ write_basic_package_version_file(${CMAKE_BINARY_DIR}/MovieConvConfigVersion.cmak
 install(FILES ${CMAKE_BINARY_DIR}/MovieConvConfig.cmake ${CMAKE_BINARY_DIR}/MovieConvConfigVersion.cmake
   DESTINATION ${package_dir})
 
-# pkg-config movieconv
+# pkg-config movieconv, movieconv-companions
 set(pkgconfig_dir ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
 file(RELATIVE_PATH MOVIECONV_PREFIX_FROM_PC ${CMAKE_INSTALL_PREFIX}/${pkgconfig_dir} ${CMAKE_INSTALL_PREFIX})
 string(REGEX REPLACE "/$" "" MOVIECONV_PREFIX_FROM_PC ${MOVIECONV_PREFIX_FROM_PC})
-configure_file(cmake/movieconv.pc.in ${CMAKE_BINARY_DIR}/movieconv.pc @ONLY)
-install(FILES ${CMAKE_BINARY_DIR}/movieconv.pc DESTINATION ${pkgconfig_dir})
+foreach(name IN ITEMS movieconv movieconv-companions)
+  configure_file(cmake/${name}.pc.in ${CMAKE_BINARY_DIR}/${name}.pc @ONLY)
+  install(FILES ${CMAKE_BINARY_DIR}/${name}.pc DESTINATION ${pkgconfig_dir})
+endforeach()
 
 # cpack
 set(CPACK_GENERATOR DEB)

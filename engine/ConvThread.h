@@ -7,7 +7,7 @@
 #include "media/Decoders.h"
 #include "media/EncodeParam.h"
 #include "media/ProgressCallback.h"
-#include "platform/Platform.h"
+#include "platform/Window.h"
 #include "thread/BaseThread.h"
 
 #include <atomic>

@@ -1,5 +1,9 @@
 #include "engine/PostMessage.h"
 
+#include "platform/Platform.h"
+
+#include <cstdint>
+
 namespace {
 
 constexpr OSType kKind = 0x6B696E64;   // 'kind'

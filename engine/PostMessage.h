@@ -3,7 +3,7 @@
 #ifndef MOVIECONV_ENGINE_POSTMESSAGE_H
 #define MOVIECONV_ENGINE_POSTMESSAGE_H
 
-#include "platform/Platform.h"
+#include "platform/Window.h"
 
 /// The class of the converter's events.
 constexpr unsigned kProgressMessage = 5000;

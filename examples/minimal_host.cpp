@@ -1,7 +1,6 @@
-// A host in a hundred lines: it draws pictures, hums a tone and has the engine make a movie of both.
-// Usage: minimal_host OUTPUT.mp4
-#include "api/MovieConv.h"
-#include "writer/WriterStatus.h"
+// A host in C++ that brings decoder objects: it draws pictures, hums a tone and has the engine make a movie
+// of both. Usage: minimal_host OUTPUT.mp4
+#include <movieconv/MovieConv.h>
 
 #include <array>
 #include <cmath>
@@ -75,26 +74,32 @@ private:
 };
 
 /// Comes on the engine's thread; 0 would cancel.
-unsigned Report(void* outcome, unsigned kind, unsigned value, uintptr_t) {
-    if (kind == 1)
-        *static_cast<unsigned*>(outcome) = value;
-    else
+unsigned Report(void*, unsigned kind, unsigned value, uintptr_t) {
+    if (kind == 0)
         std::fprintf(stderr, "%5.1f %%\n", value / 100.0);
     return 1;
 }
 
 int main(int argc, char** argv) {
     const std::string name = argc == 2 ? argv[1] : "out.mp4"; // ASCII; wide names are UTF-32
+    const std::wstring wide(name.begin(), name.end());
     Pictures pictures;
     Sound sound;
-    unsigned outcome = kOutcomeFailed;
+    EncodeParam param;
+    MCResult result = {sizeof result};
+    MCSetLogCallback([](void*, int, const char*) {}, nullptr); // or a log of one's own
     MCHandle converter = MCCreate(&pictures, &sound);
-    MCSetOutputFile(converter, std::wstring(name.begin(), name.end()).c_str());
-    if (MCStart(converter, 0.0, 0.0, nullptr, Report, &outcome) == 0)
+    if (!converter || !MCEncodeParamForFile(wide.c_str(), &param))
+        return std::fprintf(stderr, "no converter, or an extension that tells no format\n"), 1;
+    MCSetEncodeParam(converter, &param);
+    MCSetOutputFile(converter, wide.c_str());
+    MCEnableEvents(converter, 0);        // nobody here receives them
+    MCEnableStopOnFailure(converter, 1); // a full disk ends it at once
+    if (MCStart(converter, 0.0, 0.0, nullptr, Report, nullptr) == 0)
         MCWait(converter, MC_INFINITE);
+    MCGetResult(converter, &result);
     MCDestroy(converter);
-    WriterStatus failure{}; // writing may fail where the engine finds nothing amiss
-    if (MWGetLastFailure(kWriterDefaultSet, &failure))
-        return std::fprintf(stderr, "%s: %s\n", failure.szPath, failure.szWhat), 1;
-    return outcome == kOutcomeCompleted ? 0 : 1;
+    if (!result.bDone)
+        std::fprintf(stderr, "%s: %s\n", result.szPath, result.szWhat);
+    return result.bDone ? 0 : 1;
 }

@@ -5,6 +5,11 @@
 
 #include <stdint.h>
 
+/// The code whose first character is `a`: MC_FOURCC('H', '2', '6', '4').
+#define MC_FOURCC(a, b, c, d)                                                                                \
+    ((uint32_t)(unsigned char)(a) | (uint32_t)(unsigned char)(b) << 8 | (uint32_t)(unsigned char)(c) << 16 | \
+     (uint32_t)(unsigned char)(d) << 24)
+
 #ifdef __cplusplus
 /// The code whose first character is `a`; it stands in the lowest byte ("MP4 " is 0x2034504D).
 constexpr uint32_t FourCC(char a, char b, char c, char d) {

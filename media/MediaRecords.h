@@ -6,6 +6,8 @@
 
 #include <stdint.h>
 
+#define MC_TICKS_PER_SECOND 10000000 ///< Time stamps and durations count 100 ns.
+
 #ifdef __cplusplus
 #include <cstddef>
 

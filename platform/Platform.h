@@ -8,6 +8,8 @@
 #ifndef MOVIECONV_PLATFORM_PLATFORM_H
 #define MOVIECONV_PLATFORM_PLATFORM_H
 
+#include "platform/Window.h"
+
 #include <stdint.h>
 
 #ifdef __cplusplus
@@ -21,9 +23,6 @@ typedef int32_t OSStatus;      ///< noErr, or what went wrong.
 typedef uint32_t OSType; ///< Four characters, the first in the highest byte, as a literal of 'abcd' has them.
 typedef unsigned long ByteCount; ///< A size in bytes.
 typedef unsigned long ItemCount; ///< A number of things.
-
-/// A window of the host. The engine hands references to it on and never looks inside.
-typedef struct OpaqueWindowPtr OpaqueWindowPtr;
 
 typedef struct OpaqueEventRef* EventRef;           ///< A counted reference to an event.
 typedef struct OpaqueEventQueueRef* EventQueueRef; ///< A queue of events.

@@ -1,6 +1,7 @@
 // The interface as a C program uses it.
 #include "api/MovieConv.h"
 #include "media/MediaWriter.h"
+#include "platform/Platform.h"
 
 static unsigned Callback(void* context, unsigned kind, unsigned value, uintptr_t info) {
     const ProgressInfo* progress = (const ProgressInfo*)info;

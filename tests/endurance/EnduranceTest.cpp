@@ -3,6 +3,7 @@
 // sanitizer has to stay silent. MOVIECONV_ENDURANCE sets the number of rounds. Built twice: for the engine
 // alone, over the recording writer, and for the whole with the real one.
 #include "api/MovieConv.h"
+#include "platform/Platform.h"
 #include "tests/engine/IdleParts.h"
 #include "tests/support/Folder.h"
 

@@ -5,6 +5,7 @@
 #define MOVIECONV_TESTS_ENGINE_SCRIPTEDHOST_H
 
 #include "api/MovieConv.h"
+#include "platform/Platform.h"
 #include "tests/recorder/RecordingWriter.h"
 
 #include <climits>
