@@ -1,0 +1,124 @@
+"""Converting movie files with the program movieconv, which reads whatever FFmpeg does."""
+
+from __future__ import annotations
+
+import json
+import os
+import shutil
+import signal
+import subprocess
+import tempfile
+from dataclasses import dataclass
+from typing import Any, Iterator, List, Optional
+
+from ._engine import ConversionError
+from ._library import library
+
+
+@dataclass(frozen=True)
+class FileProgress:
+    """How far a conversion is. None stands for a figure that is not known yet; times are seconds."""
+
+    phase: str  # "converting", "paused", "finishing" or "waiting_for_room"
+    percent: float
+    position: float
+    speed: Optional[float]
+    left: Optional[float]
+    bytes: int
+
+
+def _program() -> str:
+    """The program: that which MOVIECONV_PROGRAM names, else one beside the library, else one in the PATH."""
+    beside = os.path.join(os.path.dirname(os.path.realpath(library()._name)), "movieconv")
+    for candidate in (os.environ.get("MOVIECONV_PROGRAM"), beside, shutil.which("movieconv")):
+        if candidate and os.access(candidate, os.X_OK):
+            return candidate
+    raise FileNotFoundError("The program movieconv is not installed; MOVIECONV_PROGRAM can name it.")
+
+
+class Conversion:
+    """A running conversion. Iterating over it gives FileProgress until it is done and raises ConversionError when
+    it fails; `wait()` does that without the news. Leaving a `with` block early stops it."""
+
+    def __init__(self, arguments: List[str]) -> None:
+        self._messages = tempfile.TemporaryFile()
+        self._process = subprocess.Popen(
+            [_program(), "--progress", "json", *arguments], stdin=subprocess.DEVNULL, stdout=subprocess.PIPE,
+            stderr=self._messages)
+        self._paused = False
+        self._stopped = False
+        self.warnings: List[str] = []  # what was put right or is worth knowing
+        self.files: List[str] = []  # complete, on the disk, under their names
+
+    def __iter__(self) -> Iterator[FileProgress]:
+        errors: List[str] = []
+        assert self._process.stdout is not None
+        for line in self._process.stdout:
+            event = json.loads(line)
+            if event["event"] == "progress":
+                yield FileProgress(event["phase"], event["percent"] or 0.0, event["position_s"] or 0.0,
+                                   event["speed"], event["left_s"], event["bytes"] or 0)
+            elif event["event"] == "clip_closed":
+                self.files.append(event["path"])
+            elif event["event"] in ("warning", "error"):
+                (self.warnings if event["event"] == "warning" else errors).append(event["text"])
+        self._conclude(errors)
+
+    def _conclude(self, errors: List[str]) -> None:
+        code = self._process.wait()
+        if code == 0 or (self._stopped and code == 6):
+            return
+        self._messages.seek(0)
+        messages = self._messages.read().decode("utf-8", "replace").strip()
+        text = " ".join(errors) or messages or f"The program movieconv ended with {code}."
+        raise ConversionError(text)
+
+    def wait(self) -> None:
+        """Returns when the conversion is done; raises as iterating does."""
+        for _ in self:
+            pass
+
+    def pause(self) -> None:
+        """Halts it until resume()."""
+        self._signal(signal.SIGSTOP)
+        self._paused = True
+
+    def resume(self) -> None:
+        """Goes on after pause()."""
+        self._signal(signal.SIGCONT)
+        self._paused = False
+
+    @property
+    def paused(self) -> bool:
+        return self._paused
+
+    def stop(self) -> None:
+        """Ends it; the output is finished with what was converted. Iterating ends then, without an error."""
+        self._stopped = True
+        self._signal(signal.SIGTERM)
+        self.resume()
+
+    def _signal(self, number: int) -> None:
+        if self._process.poll() is None:
+            self._process.send_signal(number)
+
+    def __enter__(self) -> "Conversion":
+        return self
+
+    def __exit__(self, *_error: Any) -> None:
+        if self._process.poll() is None:
+            self.stop()
+            self._process.wait()
+        if self._process.stdout is not None:
+            self._process.stdout.close()
+        self._messages.close()
+
+
+def convert(source: "str | os.PathLike[str]", output: "str | os.PathLike[str]", *options: str) -> Conversion:
+    """Converts a movie file; `options` are the program's, as in convert(a, b, "--size", "640x360").
+
+        with movieconv.convert("in.mkv", "out.mp4") as conversion:
+            for progress in conversion:
+                print(progress.percent)
+    """
+    return Conversion([*options, "--", os.fspath(source), os.fspath(output)])
