@@ -1,0 +1,148 @@
+#include "host/window/model/Journal.h"
+
+#include "text/Path.h"
+
+#include <QCoreApplication>
+#include <QDir>
+#include <QFile>
+#include <QJsonArray>
+#include <QJsonDocument>
+#include <QStandardPaths>
+
+#include <cerrno>
+#include <cstdio>
+#include <cstring>
+#include <fcntl.h>
+#include <unistd.h>
+#include <utility>
+
+namespace movieconv::window {
+namespace {
+
+constexpr int kVersion = 1;
+
+struct Descriptor {
+    explicit Descriptor(int number) : number(number) {}
+    Descriptor(const Descriptor&) = delete;
+    Descriptor& operator=(const Descriptor&) = delete;
+    ~Descriptor() {
+        if (number >= 0)
+            close(number);
+    }
+    int number;
+};
+
+bool WriteAll(int descriptor, const QByteArray& bytes) {
+    for (qsizetype done = 0; done < bytes.size();) {
+        const ssize_t count =
+            write(descriptor, bytes.data() + done, static_cast<size_t>(bytes.size() - done));
+        if (count < 0 && errno == EINTR)
+            continue;
+        if (count <= 0)
+            return false;
+        done += count;
+    }
+    return true;
+}
+
+/// Replaces the file so that after a power cut it is the old one or the new one. False with errno set.
+bool Replace(const std::string& path, const QByteArray& bytes) {
+    const std::string temporary = path + ".new";
+    {
+        const Descriptor file(open(temporary.c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0600));
+        if (file.number < 0 || !WriteAll(file.number, bytes) || fsync(file.number) != 0)
+            return false;
+    }
+    if (std::rename(temporary.c_str(), path.c_str()) != 0)
+        return false;
+    const Descriptor folder(open(text::FolderOf(path).c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC));
+    return folder.number >= 0 && fsync(folder.number) == 0;
+}
+
+QByteArray Serialise(const std::vector<Entry>& entries) {
+    QJsonArray array;
+    for (const Entry& entry : entries)
+        array.append(ToJson(entry));
+    return QJsonDocument(
+               QJsonObject{{QStringLiteral("version"), kVersion}, {QStringLiteral("entries"), array}})
+        .toJson(QJsonDocument::Compact);
+}
+
+} // namespace
+
+Journal::Journal(std::string path, OnFailure failed)
+    : path_(std::move(path)), failed_(std::move(failed)), thread_([this] { Run(); }) {}
+
+Journal::~Journal() {
+    {
+        const std::lock_guard lock(mutex_);
+        ending_ = true;
+        changed_.notify_all();
+    }
+    thread_.join();
+}
+
+std::vector<Entry> Journal::Load(QString& complaint) {
+    QFile file(QFile::decodeName(path_.c_str()));
+    if (!file.open(QIODevice::ReadOnly))
+        return {};
+    const QJsonObject json = QJsonDocument::fromJson(file.readAll()).object();
+    if (json[QLatin1String("version")].toInt() != kVersion) {
+        const std::string aside = path_ + ".unreadable";
+        std::rename(path_.c_str(), aside.c_str());
+        complaint =
+            QCoreApplication::translate("Journal", "The saved queue could not be read. It was kept as %1.")
+                .arg(Readable(aside));
+        return {};
+    }
+    std::vector<Entry> entries;
+    for (const QJsonValue& value : json[QLatin1String("entries")].toArray())
+        if (auto entry = EntryFromJson(value.toObject()))
+            entries.push_back(*std::move(entry));
+    return entries;
+}
+
+void Journal::Keep(std::vector<Entry> entries) {
+    const std::lock_guard lock(mutex_);
+    next_ = std::move(entries);
+    changed_.notify_all();
+}
+
+void Journal::Settle() {
+    std::unique_lock lock(mutex_);
+    changed_.wait(lock, [&] { return !next_ && !writing_; });
+}
+
+std::string Journal::UsualPath() {
+    const QString folder = QStandardPaths::writableLocation(QStandardPaths::AppLocalDataLocation);
+    QDir().mkpath(folder);
+    return QFile::encodeName(folder + QStringLiteral("/queue.json")).toStdString();
+}
+
+void Journal::Run() {
+    std::unique_lock lock(mutex_);
+    while (true) {
+        changed_.wait(lock, [&] { return next_ || ending_; });
+        if (!next_)
+            return;
+        const std::vector<Entry> entries = *std::exchange(next_, std::nullopt);
+        writing_ = true;
+        lock.unlock();
+        WriteAndTell(entries);
+        lock.lock();
+        writing_ = false;
+        changed_.notify_all();
+    }
+}
+
+void Journal::WriteAndTell(const std::vector<Entry>& entries) {
+    const bool failed = !Replace(path_, Serialise(entries));
+    if (failed && !failing_ && failed_) {
+        failed_(QCoreApplication::translate(
+                    "Journal", "The queue cannot be saved in %1: %2. It will be lost when the program ends.")
+                    .arg(Readable(path_), QString::fromLocal8Bit(std::strerror(errno))));
+    }
+    failing_ = failed;
+}
+
+} // namespace movieconv::window

@@ -1,0 +1,64 @@
+#include "host/window/model/Naming.h"
+
+#include "text/Path.h"
+
+#include <QDate>
+
+#include <algorithm>
+
+namespace movieconv::window {
+namespace {
+
+constexpr size_t kLongestName = 240; // of 255 bytes: the rest is for the temporary file's ending
+
+std::string Stem(const std::string& path) {
+    const std::string name = path.substr(path.rfind('/') + 1);
+    const size_t dot = name.rfind('.');
+    return dot == std::string::npos || dot == 0 ? name : name.substr(0, dot);
+}
+
+void ReplaceAll(std::string& text, const std::string& mark, const std::string& value) {
+    for (size_t at = text.find(mark); at != std::string::npos; at = text.find(mark, at + value.size()))
+        text.replace(at, mark.size(), value);
+}
+
+/// Not through the middle of a character.
+std::string Cut(const std::string& text, size_t most) {
+    if (text.size() <= most)
+        return text;
+    size_t size = most;
+    while (size > 0 && (static_cast<unsigned char>(text[size]) & 0xC0) == 0x80)
+        --size;
+    return text.substr(0, size);
+}
+
+std::string Fill(const Entry& entry, const QString& pattern) {
+    std::string name = pattern.toStdString();
+    const int height = entry.wishes.height.value_or(entry.facts ? entry.facts->height : 0);
+    ReplaceAll(name, "{preset}", entry.wishes.preset.toStdString());
+    ReplaceAll(name, "{height}", height > 0 ? std::to_string(height) + "p" : std::string());
+    ReplaceAll(name, "{date}", QDate::currentDate().toString(Qt::ISODate).toStdString());
+    ReplaceAll(name, "{name}", Stem(entry.source)); // last: a source's name may hold marks
+    std::replace(name.begin(), name.end(), '/', '-');
+    const bool useless = name.find_first_not_of(" .") == std::string::npos;
+    return useless ? Stem(entry.source) : name;
+}
+
+} // namespace
+
+std::string TargetFor(const Entry& entry, const Naming& naming, const QString& extension,
+                      const IsTaken& isTaken) {
+    const std::string folder = naming.folder.empty() ? text::FolderOf(entry.source) : naming.folder;
+    const std::string stem = Fill(entry, naming.pattern);
+    std::string path;
+    int number = 1;
+    do {
+        const std::string ending = (number > 1 ? " (" + std::to_string(number) + ")" : std::string()) + "." +
+                                   extension.toStdString();
+        path = (folder == "/" ? folder : folder + "/") + Cut(stem, kLongestName - ending.size()) + ending;
+        ++number;
+    } while (isTaken(path));
+    return path;
+}
+
+} // namespace movieconv::window

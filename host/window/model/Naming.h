@@ -1,0 +1,30 @@
+// Where the files go and what they are called.
+#ifndef MOVIECONV_HOST_WINDOW_MODEL_NAMING_H
+#define MOVIECONV_HOST_WINDOW_MODEL_NAMING_H
+
+#include "host/window/model/Entry.h"
+
+#include <functional>
+#include <string>
+
+namespace movieconv::window {
+
+struct Naming {
+    /// With {name} for the source's name, {preset}, {height} and {date}.
+    QString pattern = QStringLiteral("{name}");
+    std::string folder; ///< Empty: beside the source.
+
+    bool operator==(const Naming&) const = default;
+};
+
+/// Whether a name is used already.
+using IsTaken = std::function<bool(const std::string& path)>;
+
+/// The path for an entry's file, with " (2)" and so on where the name is taken. Never longer than a file
+/// system takes.
+std::string TargetFor(const Entry& entry, const Naming& naming, const QString& extension,
+                      const IsTaken& isTaken);
+
+} // namespace movieconv::window
+
+#endif

@@ -1,0 +1,322 @@
+#include "host/window/model/Queue.h"
+
+#include "host/window/model/Intake.h"
+#include "host/window/model/Words.h"
+#include "text/Path.h"
+
+#include <algorithm>
+#include <filesystem>
+#include <set>
+#include <stdexcept>
+#include <utility>
+
+namespace movieconv::window {
+namespace {
+
+bool Exists(const std::string& path) {
+    std::error_code unknown;
+    return std::filesystem::exists(std::filesystem::symlink_status(path, unknown));
+}
+
+} // namespace
+
+Queue::Queue(Runner& runner, Journal& journal, QObject* parent)
+    : QAbstractListModel(parent), runner_(runner), journal_(journal), presets_(runner.Presets()) {}
+
+Queue::~Queue() = default;
+
+QString Queue::Restore() {
+    QString complaint;
+    std::vector<Entry> kept = journal_.Load(complaint);
+    beginResetModel();
+    entries_ = std::move(kept);
+    for (Entry& entry : entries_)
+        entry.id = ++lastId_;
+    endResetModel();
+    Q_EMIT Rearranged();
+    for (const Entry& entry : entries_)
+        if (entry.state == State::kWaiting || entry.state == State::kInterrupted)
+            Examine(entry.id);
+    return complaint;
+}
+
+const Entry* Queue::Find(quint64 id) const {
+    const int row = RowOf(id);
+    return row < 0 ? nullptr : &entries_[static_cast<size_t>(row)];
+}
+
+int Queue::RowOf(quint64 id) const {
+    const auto found =
+        std::find_if(entries_.begin(), entries_.end(), [&](const Entry& entry) { return entry.id == id; });
+    return found == entries_.end() ? -1 : static_cast<int>(found - entries_.begin());
+}
+
+void Queue::Add(std::vector<std::string> paths) {
+    ++searches_;
+    worker_.Do(0, [this, paths = std::move(paths)] {
+        QStringList complaints;
+        std::vector<std::string> movies = FindMovies(paths, complaints);
+        QMetaObject::invokeMethod(this, [this, movies = std::move(movies), complaints] {
+            --searches_;
+            Append(movies);
+            for (const QString& complaint : complaints)
+                Q_EMIT Complaint(complaint);
+        });
+    });
+}
+
+void Queue::Append(const std::vector<std::string>& movies) {
+    if (movies.empty()) {
+        Q_EMIT Rearranged();
+        return;
+    }
+    const int first = static_cast<int>(entries_.size());
+    beginInsertRows({}, first, first + static_cast<int>(movies.size()) - 1);
+    for (const std::string& movie : movies) {
+        Entry entry;
+        entry.id = ++lastId_;
+        entry.source = movie;
+        entry.wishes = defaults_;
+        AssignTarget(entry);
+        entries_.push_back(std::move(entry));
+    }
+    endInsertRows();
+    Keep();
+    Q_EMIT Rearranged();
+    for (size_t row = static_cast<size_t>(first); row < entries_.size(); ++row)
+        Examine(entries_[row].id);
+}
+
+void Queue::Remove(const QList<quint64>& ids) {
+    const size_t before = entries_.size();
+    for (const quint64 id : ids) {
+        const int row = RowOf(id);
+        if (row < 0 || entries_[static_cast<size_t>(row)].state == State::kActive)
+            continue;
+        beginRemoveRows({}, row, row);
+        entries_.erase(entries_.begin() + row);
+        endRemoveRows();
+    }
+    if (entries_.size() != before) {
+        Keep();
+        Q_EMIT Rearranged();
+    }
+}
+
+void Queue::RemoveOver() {
+    QList<quint64> ids;
+    for (const Entry& entry : entries_)
+        if (entry.IsOver())
+            ids.append(entry.id);
+    Remove(ids);
+}
+
+void Queue::Move(quint64 id, int row) {
+    const int from = RowOf(id);
+    const int to = std::clamp(row, 0, static_cast<int>(entries_.size()) - 1);
+    if (from >= 0 && from != to)
+        moveRows({}, from, 1, {}, to > from ? to + 1 : to);
+}
+
+bool Queue::moveRows(const QModelIndex& from, int first, int count, const QModelIndex& to, int before) {
+    const int end = first + count;
+    if (count < 1 || first < 0 || end > rowCount() || before < 0 || before > rowCount() ||
+        !beginMoveRows(from, first, end - 1, to, before))
+        return false;
+    const auto begin = entries_.begin();
+    if (before < first)
+        std::rotate(begin + before, begin + first, begin + end);
+    else
+        std::rotate(begin + first, begin + end, begin + before);
+    endMoveRows();
+    Keep();
+    Q_EMIT Rearranged();
+    return true;
+}
+
+void Queue::SetWishes(quint64 id, const Wishes& wishes) {
+    Entry* entry = FindWaiting(id);
+    if (entry == nullptr || entry->wishes == wishes)
+        return;
+    entry->wishes = wishes;
+    if (!entry->targetNamed)
+        AssignTarget(*entry);
+    AfterEdit(id);
+}
+
+void Queue::SetTarget(quint64 id, const std::string& path) {
+    Entry* entry = FindWaiting(id);
+    if (entry == nullptr || (entry->targetNamed && entry->target == path))
+        return;
+    entry->targetNamed = !path.empty();
+    entry->replace = false;
+    entry->target = path;
+    if (path.empty())
+        AssignTarget(*entry);
+    AfterEdit(id);
+}
+
+void Queue::SetReplace(quint64 id, bool replace) {
+    Entry* entry = FindWaiting(id);
+    if (entry == nullptr || entry->replace == replace)
+        return;
+    entry->replace = replace;
+    AfterEdit(id);
+}
+
+void Queue::Retry(const QList<quint64>& ids) {
+    for (const quint64 id : ids) {
+        const Entry* entry = Find(id);
+        if (entry == nullptr || !entry->IsOver())
+            continue;
+        Change(
+            id,
+            [](Entry& again) {
+                again.state = State::kWaiting;
+                again.examined = false;
+                again.figures = {};
+                again.outcome = {};
+                again.notes.clear();
+            },
+            true);
+        Examine(id);
+    }
+}
+
+void Queue::SetNaming(const Naming& naming) {
+    if (naming == naming_)
+        return;
+    naming_ = naming;
+    for (Entry& entry : entries_) {
+        if (entry.state != State::kWaiting || entry.targetNamed)
+            continue;
+        AssignTarget(entry);
+        AfterEdit(entry.id);
+    }
+}
+
+void Queue::Change(quint64 id, const std::function<void(Entry&)>& change, bool keep) {
+    const int row = RowOf(id);
+    if (row < 0)
+        return;
+    change(entries_[static_cast<size_t>(row)]);
+    if (keep)
+        Keep();
+    Q_EMIT dataChanged(index(row), index(row));
+    Q_EMIT Changed(id);
+}
+
+QString Queue::ExtensionFor(const Wishes& wishes) const {
+    if (wishes.format)
+        return *wishes.format;
+    const auto preset = std::find_if(presets_.begin(), presets_.end(),
+                                     [&](const PresetFacts& facts) { return facts.name == wishes.preset; });
+    return preset == presets_.end() ? QStringLiteral("mp4") : preset->extension;
+}
+
+int Queue::rowCount(const QModelIndex& parent) const {
+    return parent.isValid() ? 0 : static_cast<int>(entries_.size());
+}
+
+QVariant Queue::data(const QModelIndex& index, int role) const {
+    if (!index.isValid() || index.row() >= rowCount())
+        return {};
+    const Entry& entry = entries_[static_cast<size_t>(index.row())];
+    switch (role) {
+    case Qt::DisplayRole:
+        return NameOf(entry.source);
+    case Qt::ToolTipRole:
+        return Readable(entry.source);
+    case Qt::AccessibleTextRole:
+        return QStringLiteral("%1, %2").arg(NameOf(entry.source), StateLine(entry));
+    case kIdRole:
+        return entry.id;
+    default:
+        return {};
+    }
+}
+
+Qt::ItemFlags Queue::flags(const QModelIndex& index) const {
+    return index.isValid()
+               ? Qt::ItemIsSelectable | Qt::ItemIsEnabled | Qt::ItemIsDragEnabled | Qt::ItemNeverHasChildren
+               : Qt::ItemIsDropEnabled;
+}
+
+/// Finds out what the movie is, whether its target's name is free, and what stands in the way.
+void Queue::Examine(quint64 id) {
+    const Entry* entry = Find(id);
+    if (entry == nullptr)
+        return;
+    std::set<std::string> others;
+    for (const Entry& other : entries_)
+        if (other.id != id)
+            others.insert(other.target);
+    worker_.Do(id, [this, id, seen = *entry, naming = naming_, others = std::move(others),
+                    extension = ExtensionFor(entry->wishes)] {
+        Entry found = seen;
+        try {
+            if (!found.facts)
+                found.facts = runner_.Look(found.source);
+            if (!found.targetNamed && found.state == State::kWaiting) {
+                found.target = TargetFor(found, naming, extension, [&](const std::string& path) {
+                    return others.contains(path) || Exists(path);
+                });
+            }
+            found.findings =
+                runner_.Check({found.source, found.target, found.wishes, found.replace}, *found.facts);
+            found.unusable.clear();
+        } catch (const std::runtime_error& error) {
+            found.unusable = QString::fromUtf8(error.what());
+        }
+        QMetaObject::invokeMethod(this, [this, id, seen, found] {
+            const Entry* now = Find(id);
+            if (now == nullptr || now->state != seen.state || now->wishes != seen.wishes ||
+                now->target != seen.target || now->replace != seen.replace)
+                return; // edited meanwhile, and so examined again
+            if (!found.targetNamed && IsTakenByOther(*now, found.target)) {
+                Examine(id);
+                return;
+            }
+            Change(
+                id,
+                [&](Entry& known) {
+                    known.facts = found.facts;
+                    known.target = found.target;
+                    known.findings = found.findings;
+                    known.unusable = found.unusable;
+                    known.examined = true;
+                },
+                found.target != seen.target);
+        });
+    });
+}
+
+/// By the rules, and apart from the other entries' targets; whether there is such a file is found out later.
+void Queue::AssignTarget(Entry& entry) {
+    entry.target = TargetFor(entry, naming_, ExtensionFor(entry.wishes), [&](const std::string& path) {
+        return path == entry.source || IsTakenByOther(entry, path);
+    });
+}
+
+bool Queue::IsTakenByOther(const Entry& entry, const std::string& path) const {
+    return std::any_of(entries_.begin(), entries_.end(),
+                       [&](const Entry& other) { return other.id != entry.id && other.target == path; });
+}
+
+void Queue::Keep() {
+    journal_.Keep(entries_);
+}
+
+Entry* Queue::FindWaiting(quint64 id) {
+    const int row = RowOf(id);
+    Entry* entry = row < 0 ? nullptr : &entries_[static_cast<size_t>(row)];
+    return entry != nullptr && entry->state == State::kWaiting ? entry : nullptr;
+}
+
+void Queue::AfterEdit(quint64 id) {
+    Change(
+        id, [](Entry& entry) { entry.examined = false; }, true);
+    Examine(id);
+}
+
+} // namespace movieconv::window
