@@ -191,9 +191,11 @@ void Dispatcher::ShowPicturesOf(quint64 id) {
 /// Starts what there is room for; ends the work when nothing is left.
 void Dispatcher::Fill() {
     while (working_ && !stopAfterThis_ && static_cast<int>(active_.size()) < atOnce_) {
-        const auto next = std::find_if(queue_.Entries().begin(), queue_.Entries().end(),
-                                       [](const Entry& entry) { return entry.IsStartable(); });
-        if (next == queue_.Entries().end())
+        // What is still looked at keeps its turn.
+        const auto next =
+            std::find_if(queue_.Entries().begin(), queue_.Entries().end(),
+                         [](const Entry& entry) { return entry.IsStartable() || entry.IsBeingExamined(); });
+        if (next == queue_.Entries().end() || !next->IsStartable())
             break;
         Begin(*next);
     }
@@ -213,7 +215,8 @@ bool Dispatcher::HasMore() const {
 
 void Dispatcher::Begin(const Entry& entry) {
     const quint64 id = entry.id;
-    const Order order{entry.source, entry.target, entry.wishes, entry.replace};
+    const Order order{entry.source, entry.target, entry.wishes, entry.replace,
+                      entry.facts.value_or(MovieFacts{})};
     Active& active = active_[id];
     active.mailbox = std::make_shared<Mailbox>(*this, id);
     active.run = runner_.Start(order, active.mailbox);

@@ -206,6 +206,10 @@ void Queue::Change(quint64 id, const std::function<void(Entry&)>& change, bool k
     Q_EMIT Changed(id);
 }
 
+void Queue::FillPresets() {
+    presets_ = runner_.Presets();
+}
+
 QString Queue::ExtensionFor(const Wishes& wishes) const {
     if (wishes.format)
         return *wishes.format;
@@ -263,7 +267,7 @@ void Queue::Examine(quint64 id) {
                 });
             }
             found.findings =
-                runner_.Check({found.source, found.target, found.wishes, found.replace}, *found.facts);
+                runner_.Check({found.source, found.target, found.wishes, found.replace, *found.facts});
             found.unusable.clear();
         } catch (const std::runtime_error& error) {
             found.unusable = QString::fromUtf8(error.what());

@@ -61,6 +61,8 @@ public:
     /// Changes an entry, tells and, with `keep`, writes the journal.
     void Change(quint64 id, const std::function<void(Entry&)>& change, bool keep);
 
+    /// Asks the runner anew which presets there are.
+    void FillPresets();
     /// The extension of the file that the wishes make.
     QString ExtensionFor(const Wishes& wishes) const;
 
@@ -88,7 +90,7 @@ private:
 
     Runner& runner_;
     Journal& journal_;
-    const std::vector<PresetFacts> presets_;
+    std::vector<PresetFacts> presets_;
     std::vector<Entry> entries_;
     quint64 lastId_ = 0;
     Naming naming_;

@@ -54,15 +54,25 @@ struct PresetFacts {
     int quality = 60;    ///< On Wishes' scale, or -1 when there is nothing to choose.
 };
 
+/// What the window need not offer where it is missing.
+struct Abilities {
+    bool tracks = false; ///< Choosing among sound tracks and subtitles.
+    bool deinterlace = false;
+    bool crop = false;
+    bool presetFiles = false;
+};
+
 struct Order {
     std::string source; ///< Bytes as the system has them, like every path here.
     std::string target;
     Wishes wishes;
     bool replace = false; ///< An existing target.
+    MovieFacts facts;     ///< Of the source.
 };
 
 /// What stands in the way of an order, or what it would lose.
 struct Findings {
+    bool targetExists = false;
     QStringList warnings;          ///< Sentences.
     std::optional<int64_t> needed; ///< Bytes.
     std::optional<int64_t> free;   ///< Bytes where the target goes.
@@ -131,15 +141,21 @@ public:
     Runner& operator=(const Runner&) = delete;
     virtual ~Runner() = default;
 
+    virtual Abilities Can() = 0;
     virtual std::vector<PresetFacts> Presets() = 0;
     virtual std::vector<FormatFacts> Formats() = 0;
+
+    /// These read or write a small file. Throw std::runtime_error with a sentence for people.
+    virtual PresetFacts LoadPreset(const std::string& path) = 0;
+    virtual void SavePreset(const std::string& path, const Wishes& wishes) = 0;
 
     /// Returns at once; whatever goes wrong is an outcome.
     virtual std::unique_ptr<Run> Start(const Order& order, std::shared_ptr<RunListener> listener) = 0;
 
-    /// These read the disk and may take long. Throw std::runtime_error with a sentence for people.
+    /// These read the disk and may take long; they are called on threads of their own. Throw
+    /// std::runtime_error with a sentence for people.
     virtual MovieFacts Look(const std::string& path) = 0;
-    virtual Findings Check(const Order& order, const MovieFacts& facts) = 0;
+    virtual Findings Check(const Order& order) = 0;
     /// The picture nearest before `seconds`, at most `width` pixels wide; null when there is none.
     virtual QImage PictureAt(const std::string& path, double seconds, int width) = 0;
 };

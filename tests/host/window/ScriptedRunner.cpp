@@ -77,6 +77,16 @@ std::vector<FormatFacts> ScriptedRunner::Formats() {
             {QStringLiteral("m4a"), QStringLiteral("M4A"), false}};
 }
 
+PresetFacts ScriptedRunner::LoadPreset(const std::string& path) {
+    if (!saved.contains(path))
+        throw std::runtime_error("This is no preset.");
+    return Presets().back();
+}
+
+void ScriptedRunner::SavePreset(const std::string& path, const Wishes& wishes) {
+    saved[path] = wishes;
+}
+
 std::unique_ptr<Run> ScriptedRunner::Start(const Order& order, std::shared_ptr<RunListener> listener) {
     auto script = std::make_shared<Script>();
     script->order = order;
@@ -105,9 +115,10 @@ MovieFacts ScriptedRunner::Look(const std::string& path) {
     return facts;
 }
 
-Findings ScriptedRunner::Check(const Order& order, const MovieFacts&) {
+Findings ScriptedRunner::Check(const Order& order) {
     Findings findings;
-    if (!ReadFile(order.target).empty())
+    findings.targetExists = !ReadFile(order.target).empty();
+    if (findings.targetExists)
         findings.warnings += QStringLiteral("The target exists.");
     return findings;
 }

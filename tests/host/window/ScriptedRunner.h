@@ -32,22 +32,25 @@ public:
         void End(movieconv::window::Ending ending, const QString& sentence = {});
     };
 
+    movieconv::window::Abilities Can() override { return {true, true, true, true}; }
     std::vector<movieconv::window::PresetFacts> Presets() override;
+    movieconv::window::PresetFacts LoadPreset(const std::string& path) override;
+    void SavePreset(const std::string& path, const movieconv::window::Wishes& wishes) override;
     std::vector<movieconv::window::FormatFacts> Formats() override;
     std::unique_ptr<movieconv::window::Run>
     Start(const movieconv::window::Order& order,
           std::shared_ptr<movieconv::window::RunListener> listener) override;
     /// A file whose text begins with "movie" is one; a number behind it tells its seconds.
     movieconv::window::MovieFacts Look(const std::string& path) override;
-    movieconv::window::Findings Check(const movieconv::window::Order& order,
-                                      const movieconv::window::MovieFacts& facts) override;
+    movieconv::window::Findings Check(const movieconv::window::Order& order) override;
     QImage PictureAt(const std::string& path, double seconds, int width) override;
 
     /// In the order in which they began.
     std::vector<std::shared_ptr<Script>> scripts;
     /// Stops as the real ones do: the end comes by itself.
     bool endsWhenStopped = true;
-    Gate looking; ///< Looks at movies pass it.
+    std::map<std::string, movieconv::window::Wishes> saved; ///< Presets by path.
+    Gate looking;                                           ///< Looks at movies pass it.
     std::atomic<int> looks = 0;
 };
 

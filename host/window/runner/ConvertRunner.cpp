@@ -1,0 +1,267 @@
+#include "host/window/runner/ConvertRunner.h"
+
+#include "host/convert/Formats.h"
+#include "host/convert/Job.h"
+#include "host/convert/Room.h"
+#include "host/convert/Sources.h"
+#include "host/convert/StillPicture.h"
+#include "host/window/model/Words.h"
+#include "host/window/runner/Translation.h"
+#include "text/Path.h"
+
+#include <QCoreApplication>
+
+#include <atomic>
+#include <chrono>
+#include <filesystem>
+#include <mutex>
+#include <stdexcept>
+#include <system_error>
+#include <utility>
+
+namespace movieconv::window {
+namespace {
+
+constexpr std::chrono::milliseconds kBetweenPictures{250};
+
+struct Texts {
+    Q_DECLARE_TR_FUNCTIONS(ConvertRunner)
+};
+
+QString Sentence(const std::string& text) {
+    QString sentence = QString::fromStdString(text);
+    if (!sentence.isEmpty())
+        sentence[0] = sentence[0].toUpper();
+    return sentence.endsWith(QLatin1Char('.')) || sentence.isEmpty() ? sentence : sentence + QLatin1Char('.');
+}
+
+/// A picture that shares the memory of the library's.
+QImage ToImage(const std::shared_ptr<const ShownPicture>& picture) {
+    if (!picture || picture->width <= 0)
+        return {};
+    auto* held = new std::shared_ptr<const ShownPicture>(picture);
+    return {picture->bgra.data(),
+            picture->width,
+            picture->height,
+            picture->width * 4,
+            QImage::Format_RGB32,
+            [](void* owner) { delete static_cast<std::shared_ptr<const ShownPicture>*>(owner); },
+            held};
+}
+
+QString FailureSentence(const Failure& failure) {
+    const QString what = failure.Why() == Reason::kNoMemory && failure.Text().empty()
+                             ? Texts::tr("There was not enough memory.")
+                             : Sentence(failure.Text());
+    QString advice;
+    if (failure.Why() == Reason::kExists)
+        advice = Texts::tr("Choose another name, or let it be replaced.");
+    else if (failure.Kind() == Category::kNoSpace)
+        advice = Texts::tr("Make room on the disk, or choose another folder.");
+    else if (failure.Kind() == Category::kOutput)
+        advice = Texts::tr("Choose another folder that you may write to.");
+    return advice.isEmpty() ? what : what + QLatin1Char(' ') + advice;
+}
+
+/// Hears a job and tells a listener in the window's terms.
+class Interpreter : public Observer {
+public:
+    explicit Interpreter(std::shared_ptr<RunListener> listener) : listener_(std::move(listener)) {}
+
+    void StopWasAskedFor() { stopping_ = true; }
+
+    void Started(const movieconv::Start& start) override {
+        Figures figures;
+        figures.length = start.lengthIsKnown ? start.length : 0;
+        listener_->OnFigures(figures);
+    }
+    void Progressed(const Progress& progress) override {
+        Figures figures;
+        figures.phase = stopping_                                             ? Phase::kStopping
+                        : progress.phase == movieconv::Phase::kPaused         ? Phase::kPaused
+                        : progress.phase == movieconv::Phase::kFinishing      ? Phase::kFinishing
+                        : progress.phase == movieconv::Phase::kWaitingForRoom ? Phase::kWaitingForRoom
+                                                                              : Phase::kConverting;
+        figures.position = progress.position;
+        figures.length = progress.percent ? progress.length : 0;
+        figures.fraction = progress.percent ? *progress.percent / 100 : -1;
+        figures.speed = progress.speed;
+        figures.left = progress.left;
+        figures.worked = progress.worked;
+        figures.bytes = progress.bytes;
+        listener_->OnFigures(figures);
+    }
+    void Closed(const ClosedFile& file) override { files_.push_back(file.path); }
+    void Warned(const movieconv::Warning& warning) override { listener_->OnNote(Sentence(warning.text)); }
+    void Showed(const std::shared_ptr<const ShownPicture>& picture) override {
+        listener_->OnPicture(ToImage(picture));
+    }
+    void Ended(const Verdict& verdict) override {
+        Outcome outcome;
+        outcome.ending = verdict.outcome == movieconv::Outcome::kDone      ? Ending::kDone
+                         : verdict.outcome == movieconv::Outcome::kStopped ? Ending::kStopped
+                                                                           : Ending::kFailed;
+        outcome.files = std::move(files_);
+        outcome.bytes = verdict.bytes;
+        outcome.position = verdict.position;
+        outcome.worked = verdict.worked;
+        if (verdict.failure)
+            outcome.sentence = FailureSentence(*verdict.failure);
+        else if (outcome.ending == Ending::kStopped && outcome.files.empty())
+            outcome.sentence = Texts::tr("It was stopped before anything was converted.");
+        listener_->OnEnd(outcome);
+    }
+
+private:
+    const std::shared_ptr<RunListener> listener_;
+    std::vector<std::string> files_;
+    std::atomic<bool> stopping_{false};
+};
+
+class ConvertRun : public Run {
+public:
+    ConvertRun(Request request, std::shared_ptr<RunListener> listener, Worker& remover)
+        : parts_(std::make_shared<Parts>(std::move(request), std::move(listener))), remover_(remover) {}
+    ~ConvertRun() override {
+        remover_.Do(0, [parts = std::move(parts_)]() mutable { parts.reset(); });
+    }
+
+    void Begin() {
+        try {
+            parts_->job.Start();
+        } catch (const std::system_error& error) {
+            Verdict verdict;
+            verdict.failure.emplace(Category::kInternal, error.what());
+            parts_->interpreter.Ended(verdict);
+        }
+    }
+    void Pause() override { parts_->job.Pause(); }
+    void Resume() override { parts_->job.Resume(); }
+    void Stop() override {
+        parts_->interpreter.StopWasAskedFor();
+        parts_->job.Stop();
+    }
+    void ShowPictures(bool wanted) override {
+        parts_->job.ShowPictures(wanted ? std::optional(kBetweenPictures) : std::nullopt);
+    }
+
+private:
+    struct Parts {
+        Parts(Request request, std::shared_ptr<RunListener> listener)
+            : interpreter(std::move(listener)), job(std::move(request), interpreter) {}
+        Interpreter interpreter;
+        Job job;
+    };
+
+    std::shared_ptr<Parts> parts_;
+    Worker& remover_;
+};
+
+void TellAboutSound(const SoundStreamInfo& sound, MovieFacts& facts) {
+    TrackFacts track;
+    track.number = sound.index;
+    track.details = QStringLiteral("%1, %2").arg(QString::fromStdString(sound.codec),
+                                                 QString::fromStdString(sound.layout));
+    facts.sounds.push_back(track);
+}
+
+} // namespace
+
+Abilities ConvertRunner::Can() {
+    return {};
+}
+
+std::vector<PresetFacts> ConvertRunner::Presets() {
+    return BuiltInPresets();
+}
+
+std::vector<FormatFacts> ConvertRunner::Formats() {
+    std::vector<FormatFacts> formats;
+    for (const char* extension :
+         {"mp4", "mkv", "mov", "webm", "avi", "ts", "flv", "m4a", "mp3", "flac", "ogg", "wav"})
+        if (const FileFormatInfo* format = FindFormat(extension))
+            formats.push_back(
+                {QLatin1String(extension), QString::fromUtf8(format->szName), format->bHasVideo != 0});
+    return formats;
+}
+
+PresetFacts ConvertRunner::LoadPreset(const std::string&) {
+    throw std::runtime_error("presets");
+}
+
+void ConvertRunner::SavePreset(const std::string&, const Wishes&) {
+    throw std::runtime_error("presets");
+}
+
+std::unique_ptr<Run> ConvertRunner::Start(const Order& order, std::shared_ptr<RunListener> listener) {
+    auto run = std::make_unique<ConvertRun>(ToRequest(order), std::move(listener), remover_);
+    run->Begin();
+    return run;
+}
+
+MovieFacts ConvertRunner::Look(const std::string& path) {
+    try {
+        Request request;
+        request.input = path;
+        const SourceInfo info = LookAtSource(request);
+        MovieFacts facts;
+        facts.seconds = info.duration;
+        facts.lengthKnown = info.certainty != Certainty::kGuessed;
+        facts.bytes = info.bytes;
+        if (info.pictures) {
+            facts.width = info.pictures->width;
+            facts.height = info.pictures->height;
+            facts.rate = info.pictures->frameRate;
+            facts.pictureCodec = QString::fromStdString(info.pictures->codec);
+            facts.interlaced = info.pictures->interlaced;
+        }
+        if (info.sound)
+            TellAboutSound(*info.sound, facts);
+        return facts;
+    } catch (const Failure& failure) {
+        throw std::runtime_error(Sentence(failure.Text()).toStdString());
+    }
+}
+
+Findings ConvertRunner::Check(const Order& order) {
+    namespace fs = std::filesystem;
+    Findings findings;
+    std::error_code unknown;
+    const std::string folder = text::FolderOf(order.target);
+    findings.targetExists = fs::exists(fs::symlink_status(order.target, unknown));
+    if (findings.targetExists && fs::equivalent(order.source, order.target, unknown))
+        findings.warnings +=
+            Texts::tr("The new file cannot take the place of its source. Choose another name.");
+    else if (findings.targetExists && !order.replace)
+        findings.warnings += Texts::tr("There is a file of this name already.");
+    else if (findings.targetExists)
+        findings.warnings += Texts::tr("The file that exists will be replaced.");
+    if (!fs::is_directory(folder, unknown)) {
+        findings.warnings += Texts::tr("There is no folder “%1”.").arg(Readable(folder));
+        return findings;
+    }
+    const Request request = ToRequest(order);
+    const double seconds = request.length.value_or(order.facts.seconds - request.begin);
+    findings.needed = static_cast<int64_t>(
+        seconds * ((request.noVideo ? 0 : request.videoRate.value_or(0)) + request.audioRate.value_or(0)) /
+        8);
+    if (const int64_t free = FreeBytes(folder); free >= 0) {
+        findings.free = free;
+        if (free < *findings.needed) {
+            findings.warnings += Texts::tr("About %1 are needed, but only %2 are free in “%3”.")
+                                     .arg(BytesText(*findings.needed), BytesText(free), Readable(folder));
+        }
+    }
+    return findings;
+}
+
+QImage ConvertRunner::PictureAt(const std::string& path, double seconds, int width) {
+    try {
+        const QImage picture = ToImage(movieconv::PictureAt(path, seconds));
+        return picture.isNull() ? picture : picture.scaledToWidth(width, Qt::SmoothTransformation);
+    } catch (const Failure& failure) {
+        throw std::runtime_error(failure.Text());
+    }
+}
+
+} // namespace movieconv::window

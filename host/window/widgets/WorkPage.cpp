@@ -1,0 +1,158 @@
+#include "host/window/widgets/WorkPage.h"
+
+#include "host/window/model/Words.h"
+#include "host/window/widgets/Icons.h"
+#include "host/window/widgets/LogPanel.h"
+#include "host/window/widgets/Look.h"
+
+#include <QGridLayout>
+#include <QLabel>
+#include <QLocale>
+#include <QPainter>
+#include <QPainterPath>
+#include <QPushButton>
+
+#include <cmath>
+
+namespace movieconv::window {
+namespace {
+
+constexpr int kSteps = 1000; // of the progress bar
+
+void SetText(QLabel& label, const QString& text) {
+    if (label.text() != text)
+        label.setText(text);
+}
+
+} // namespace
+
+PictureView::PictureView(QWidget* parent) : QWidget(parent) {
+    setMinimumSize(160, 90);
+    setSizePolicy(QSizePolicy::Expanding, QSizePolicy::Expanding);
+    setAccessibleName(tr("The picture that is being converted"));
+}
+
+void PictureView::Show(const QImage& picture) {
+    picture_ = picture;
+    update();
+}
+
+void PictureView::paintEvent(QPaintEvent*) {
+    QPainter painter(this);
+    painter.setRenderHints(QPainter::Antialiasing | QPainter::SmoothPixmapTransform);
+    QPainterPath outline;
+    outline.addRoundedRect(rect(), 8, 8);
+    painter.fillPath(outline, QColor(0x12, 0x14, 0x17));
+    if (picture_.isNull()) {
+        PaintSign(painter, Sign::kMovie, QRectF(rect().center() - QPoint(24, 24), QSizeF(48, 48)),
+                  QColor(0x5a, 0x60, 0x68));
+        return;
+    }
+    const QSizeF size = QSizeF(picture_.size()).scaled(QSizeF(this->size()), Qt::KeepAspectRatio);
+    const QRectF place(QPointF((width() - size.width()) / 2, (height() - size.height()) / 2), size);
+    painter.setClipPath(outline);
+    painter.drawImage(place, picture_);
+}
+
+WorkPage::WorkPage(QWidget* parent)
+    : QWidget(parent),
+      title_(MakeTitle({}, 1.25, true)),
+      picture_(new PictureView),
+      phase_(MakeHint()),
+      percent_(MakeTitle({}, 2.0, true)),
+      bar_(new SlimBar(kSteps, 8)),
+      pause_(new QPushButton),
+      stop_(new QPushButton(IconOf(Sign::kStop), tr("S&top"))),
+      log_(new LogPanel) {
+    bar_->setAccessibleName(tr("Progress of the movie"));
+    pause_->setObjectName(QStringLiteral("pauseThis"));
+    stop_->setObjectName(QStringLiteral("stopThis"));
+    pause_->setAccessibleDescription(tr("Pauses or resumes this movie"));
+    stop_->setToolTip(tr("Stops this movie; what is converted is kept."));
+    stop_->setAccessibleDescription(stop_->toolTip());
+    percent_->setAccessibleName(tr("Progress in percent"));
+    phase_->setWordWrap(false);
+    phase_->setAccessibleName(tr("What happens now"));
+
+    auto* layout = new QVBoxLayout(this);
+    layout->setContentsMargins(24, 20, 24, 16);
+    layout->setSpacing(12);
+    layout->addWidget(title_);
+    layout->addWidget(picture_, 1);
+    auto* head = new QHBoxLayout;
+    head->addWidget(percent_);
+    head->addWidget(phase_, 1);
+    head->addWidget(pause_);
+    head->addWidget(stop_);
+    layout->addLayout(head);
+    layout->addWidget(bar_);
+    layout->addWidget(MakeFigures());
+    layout->addWidget(log_);
+    connect(pause_, &QPushButton::clicked, this, [this] { Q_EMIT PauseWanted(shown_, !paused_); });
+    connect(stop_, &QPushButton::clicked, this, [this] { Q_EMIT StopWanted(shown_); });
+}
+
+QWidget* WorkPage::MakeFigures() {
+    auto* figures = new QWidget;
+    auto* grid = new QGridLayout(figures);
+    grid->setContentsMargins(0, 0, 0, 0);
+    grid->setHorizontalSpacing(28);
+    grid->setVerticalSpacing(2);
+    left_ = MakeFigure(grid, 0, tr("Time left"));
+    speed_ = MakeFigure(grid, 1, tr("Speed"));
+    position_ = MakeFigure(grid, 2, tr("Converted"));
+    bytes_ = MakeFigure(grid, 3, tr("Written"));
+    grid->setColumnStretch(4, 1);
+    return figures;
+}
+
+QLabel* WorkPage::MakeFigure(QGridLayout* grid, int column, const QString& name) {
+    QLabel* hint = MakeHint(name);
+    hint->setWordWrap(false);
+    grid->addWidget(hint, 0, column);
+    auto* value = new QLabel;
+    value->setAccessibleName(name);
+    grid->addWidget(value, 1, column);
+    return value;
+}
+
+void WorkPage::Show(const Entry& entry) {
+    if (entry.id != shown_) {
+        shown_ = entry.id;
+        picture_->Show({});
+        title_->setText(NameOf(entry.source).simplified());
+    }
+    const Figures& figures = entry.figures;
+    paused_ = figures.phase == Phase::kPaused;
+    const bool known = figures.fraction >= 0;
+    const QString unknown = QStringLiteral("–");
+    SetText(*phase_, PhaseText(figures.phase));
+    SetText(*percent_,
+            known ? tr("%1 %").arg(QLocale().toString(figures.fraction * 100, 'f', 1)) : QString());
+    percent_->setVisible(known);
+    bar_->setVisible(known);
+    if (known)
+        bar_->setValue(static_cast<int>(std::lround(figures.fraction * kSteps)));
+    SetText(*left_, figures.left ? LeftText(*figures.left) : unknown);
+    SetText(*speed_, figures.speed ? SpeedText(*figures.speed) : unknown);
+    SetText(*position_, figures.length > 0
+                            ? tr("%1 of %2").arg(ClockText(figures.position), ClockText(figures.length))
+                            : ClockText(figures.position));
+    SetText(*bytes_, BytesText(figures.bytes));
+    const QString words = paused_ ? tr("&Resume") : tr("&Pause");
+    if (pause_->text() != words) {
+        pause_->setText(words);
+        pause_->setIcon(IconOf(paused_ ? Sign::kStart : Sign::kPause));
+    }
+    const bool ending = figures.phase == Phase::kStopping || figures.phase == Phase::kFinishing;
+    pause_->setEnabled(!ending);
+    stop_->setEnabled(!ending);
+    log_->Show(entry.notes);
+}
+
+void WorkPage::ShowPicture(quint64 id, const QImage& picture) {
+    if (id == shown_)
+        picture_->Show(picture);
+}
+
+} // namespace movieconv::window

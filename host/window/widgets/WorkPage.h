@@ -1,0 +1,69 @@
+// A movie that is being converted: its picture, how far it is, how fast.
+#ifndef MOVIECONV_HOST_WINDOW_WIDGETS_WORKPAGE_H
+#define MOVIECONV_HOST_WINDOW_WIDGETS_WORKPAGE_H
+
+#include "host/window/model/Entry.h"
+
+#include <QImage>
+#include <QWidget>
+
+class QGridLayout;
+class QLabel;
+class QProgressBar;
+class QPushButton;
+
+namespace movieconv::window {
+
+class LogPanel;
+
+/// A picture as large as there is room, in its own shape.
+class PictureView : public QWidget {
+    Q_OBJECT
+public:
+    explicit PictureView(QWidget* parent = nullptr);
+    /// A null picture: none yet.
+    void Show(const QImage& picture);
+    const QImage& Picture() const { return picture_; }
+
+protected:
+    void paintEvent(QPaintEvent* event) override;
+
+private:
+    QImage picture_;
+};
+
+class WorkPage : public QWidget {
+    Q_OBJECT
+public:
+    explicit WorkPage(QWidget* parent = nullptr);
+
+    void Show(const Entry& entry);
+    void ShowPicture(quint64 id, const QImage& picture);
+
+Q_SIGNALS:
+    void PauseWanted(quint64 id, bool pause);
+    void StopWanted(quint64 id);
+
+private:
+    QWidget* MakeFigures();
+    QLabel* MakeFigure(QGridLayout* grid, int column, const QString& name);
+
+    quint64 shown_ = 0;
+    bool paused_ = false;
+    QLabel* title_;
+    PictureView* picture_;
+    QLabel* phase_;
+    QLabel* percent_;
+    QProgressBar* bar_;
+    QLabel* speed_;
+    QLabel* left_;
+    QLabel* position_;
+    QLabel* bytes_;
+    QPushButton* pause_;
+    QPushButton* stop_;
+    LogPanel* log_;
+};
+
+} // namespace movieconv::window
+
+#endif
