@@ -127,6 +127,8 @@ private:
 template <class Memory>
 class Bgr24Target {
 public:
+    static constexpr bool kReads = false;
+
     template <class Columns>
     void operator()(Columns columns, uint8_t* row, ptrdiff_t x, const Rgb& rgb) const {
         uint8_t* const target = row + 3 * x;
@@ -146,6 +148,8 @@ private:
 template <class Memory, bool kOpaque>
 class Bgr32Target {
 public:
+    static constexpr bool kReads = !kOpaque;
+
     template <class Columns>
     void operator()(Columns columns, uint8_t* row, ptrdiff_t x, const Rgb& rgb) const {
         const __m512i fourth = _mm512_set1_epi8(-1);
@@ -207,6 +211,10 @@ void RgbFrom420(Rows rgb, Planes420 source, Size size) {
             const auto luma = [&](const uint8_t* row) {
                 return _mm512_permutexvar_epi32(order, Load(columns, row + x, columns.count));
             };
+            if constexpr (Target::kReads) {
+                PrefetchRow(to.first + 2 * rgb.step + 4 * x, 4 * kStep);
+                PrefetchRow(to.second + 2 * rgb.step + 4 * x, 4 * kStep);
+            }
             store(columns, to.first, x, ToRgb<Form>(luma(from.y.first), terms));
             store(columns, to.second, x, ToRgb<Form>(luma(from.y.second), terms));
         });

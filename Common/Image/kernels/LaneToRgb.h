@@ -68,6 +68,8 @@ struct LaneToRgb {
 
     struct Bgr24Target {
         static constexpr ptrdiff_t kBytes = 3;
+        static constexpr bool kReads = false;
+        static constexpr bool kFourPixelsALane = false;
 
         /// Byte i of the first, second and third 16 bytes is component (i + j) % 3 of its pixel. One shuffle
         /// of a component serves all three, because it puts each byte where none of the other two needs one.
@@ -103,6 +105,8 @@ struct LaneToRgb {
     template <bool kOpaque>
     struct Bgr32Target {
         static constexpr ptrdiff_t kBytes = 4;
+        static constexpr bool kReads = !kOpaque;
+        static constexpr bool kFourPixelsALane = true;
 
         static Vec InPixelOrder(Vec component) {
             constexpr LaneBytes kPlaces{0, 8, 1, 9, 2, 10, 3, 11, 4, 12, 5, 13, 6, 14, 7, 15};
@@ -119,17 +123,28 @@ struct LaneToRgb {
             const Vec quads[4] = {
                 V::UnpackLo16(blueGreen[0], redFourth[0]), V::UnpackHi16(blueGreen[0], redFourth[0]),
                 V::UnpackLo16(blueGreen[1], redFourth[1]), V::UnpackHi16(blueGreen[1], redFourth[1])};
-            if constexpr (kOpaque) {
-                V::StoreLanes(p, quads);
-            } else {
-                const Vec kept = V::Set32(static_cast<int32_t>(0xFF000000));
-                V::ForVectors(quads, [&](ptrdiff_t offset, Vec pixels) {
-                    const Vec target = V::And(V::Load(p + offset), kept);
-                    V::Cached::Store(p + offset, V::Or(pixels, target)); // in the cache, as it was read
-                });
+            for (const Vec& pixels : quads) {
+                if constexpr (kOpaque) {
+                    V::Store(p, pixels);
+                } else {
+                    const Vec kept = V::Set32(static_cast<int32_t>(0xFF000000));
+                    V::Cached::Store(p, V::Blend8(pixels, V::Load(p), kept)); // in the cache, as it was read
+                }
+                p += sizeof(Vec);
             }
         }
     };
+
+    // Pixels of four bytes are stored four a lane at a time, so those that a lane holds come from there.
+
+    template <class Target>
+    static Vec LoadLuma(const uint8_t* y) {
+        return Target::kFourPixelsALane ? V::LoadByFours(y) : V::Load(y);
+    }
+    template <class Target>
+    static Vec LoadChroma(const uint8_t* u, const uint8_t* v) {
+        return Target::kFourPixelsALane ? V::LoadAlternatingByFours(u, v) : V::LoadAlternating(u, v);
+    }
 
     template <class Target, class Form, From420 RowKernels::*kKernel>
     [[gnu::flatten]] static void RgbFrom420(Rows rgb, Planes420 source, Size size) {
@@ -142,10 +157,15 @@ struct LaneToRgb {
                             [&](ptrdiff_t x) {
                                 const PlanesPair at = Advance(from, x);
                                 const RowPair pixels = Advance(to, Target::kBytes * x);
-                                const ChromaTerms terms = MakeTerms<Form>(V::LoadAlternating(at.u, at.v));
-                                Target::Store(pixels.first, MakeComponents<Form>(V::Load(at.y.first), terms));
+                                if constexpr (Target::kReads) {
+                                    PrefetchRow(pixels.first + 2 * rgb.step, Target::kBytes * kPixels);
+                                    PrefetchRow(pixels.second + 2 * rgb.step, Target::kBytes * kPixels);
+                                }
+                                const ChromaTerms terms = MakeTerms<Form>(LoadChroma<Target>(at.u, at.v));
+                                Target::Store(pixels.first,
+                                              MakeComponents<Form>(LoadLuma<Target>(at.y.first), terms));
                                 Target::Store(pixels.second,
-                                              MakeComponents<Form>(V::Load(at.y.second), terms));
+                                              MakeComponents<Form>(LoadLuma<Target>(at.y.second), terms));
                             },
                             [&](ptrdiff_t x) {
                                 (kPlainKernels.*kKernel)(rgb.At(row0, Target::kBytes * x), source.At(x, row0),

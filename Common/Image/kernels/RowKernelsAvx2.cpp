@@ -90,6 +90,20 @@ struct Avx2 {
                                Sll16<8>(_mm256_cvtepu8_epi16(LoadLane(odd))));
     }
 
+    /// Four bytes for each lane in turns, where 16 for each would come one after the other.
+    static Vec LoadByFours(const uint8_t* p) {
+        return _mm256_permutevar8x32_epi32(Load(p), _mm256_setr_epi32(0, 2, 4, 6, 1, 3, 5, 7));
+    }
+    /// Four bytes, two of them even, for each lane in turns.
+    static Vec LoadAlternatingByFours(const uint8_t* even, const uint8_t* odd) {
+        const Vec evenPlaces = _mm256_setr_epi8(0, -1, 1, -1, 4, -1, 5, -1, 8, -1, 9, -1, 12, -1, 13, -1, //
+                                                2, -1, 3, -1, 6, -1, 7, -1, 10, -1, 11, -1, 14, -1, 15, -1);
+        const Vec oddPlaces = _mm256_setr_epi8(-1, 0, -1, 1, -1, 4, -1, 5, -1, 8, -1, 9, -1, 12, -1, 13, //
+                                               -1, 2, -1, 3, -1, 6, -1, 7, -1, 10, -1, 11, -1, 14, -1, 15);
+        return _mm256_or_si256(Shuffle8(_mm256_broadcastsi128_si256(LoadLane(even)), evenPlaces),
+                               Shuffle8(_mm256_broadcastsi128_si256(LoadLane(odd)), oddPlaces));
+    }
+
     /// The second and third 8 bytes exchanged.
     static Vec ExchangeMiddle(Vec a) { return _mm256_permute4x64_epi64(a, _MM_SHUFFLE(3, 1, 2, 0)); }
 
@@ -117,13 +131,6 @@ struct Avx2 {
         take(32, _mm256_blend_epi32(parts[2], parts[0], 0xF0));
         take(64, HighLanes(parts[1], parts[2]));
     }
-    template <class Take>
-    static void ForVectors(const Vec (&parts)[4], const Take& take) {
-        take(0, LowLanes(parts[0], parts[1]));
-        take(32, LowLanes(parts[2], parts[3]));
-        take(64, HighLanes(parts[0], parts[1]));
-        take(96, HighLanes(parts[2], parts[3]));
-    }
     template <size_t kParts>
     static void StoreLanes(uint8_t* p, const Vec (&parts)[kParts]) {
         ForVectors(parts, [p](ptrdiff_t offset, Vec a) { Store(p + offset, a); });
@@ -131,11 +138,15 @@ struct Avx2 {
     static void FinishPicture() {}
 };
 
-/// Targets that no cache holds: written past the caches. Sixteen bytes a store, because that is as far as
-/// allocated memory is aligned.
+/// Targets that no cache holds: written past the caches. Where whole vectors are aligned, by these, else by
+/// their halves: allocated memory is aligned to 16 bytes.
 struct Avx2Large : Avx2 {
     static void StoreLane(uint8_t* p, __m128i a) { _mm_stream_si128(reinterpret_cast<__m128i*>(p), a); }
     static void Store(uint8_t* p, Vec a) {
+        if (reinterpret_cast<uintptr_t>(p) % sizeof a == 0) {
+            _mm256_stream_si256(reinterpret_cast<Vec*>(p), a);
+            return;
+        }
         StoreLane(p, LowLane(a));
         StoreLane(p + 16, HighLane(a));
     }

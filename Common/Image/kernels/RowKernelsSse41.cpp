@@ -19,6 +19,11 @@ struct Sse41 {
         return UnpackLo8(LoadHalf(even), LoadHalf(odd));
     }
 
+    static Vec LoadByFours(const uint8_t* p) { return Load(p); }
+    static Vec LoadAlternatingByFours(const uint8_t* even, const uint8_t* odd) {
+        return LoadAlternating(even, odd);
+    }
+
     /// Of longer vectors, the second and third 8 bytes exchanged.
     static Vec ExchangeMiddle(Vec a) { return a; }
 
