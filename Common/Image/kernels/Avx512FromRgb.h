@@ -57,11 +57,11 @@ struct PixelRun {
 /// Reads pixels of four bytes.
 class Bgr32 {
 public:
+    static constexpr int kBytes = 4;
+
     template <class Columns>
     PixelRun operator()(Columns columns, const uint8_t* row, ptrdiff_t x) const {
         const uint8_t* const source = row + 4 * x;
-        Prefetch(source);
-        Prefetch(source + 64);
         return {_mm512_shuffle_epi8(Load(columns, source, 4 * columns.count), places_),
                 _mm512_shuffle_epi8(Load(columns, source + 64, 4 * columns.count - 64), places_)};
     }
@@ -74,11 +74,11 @@ private:
 /// Reads pixels of three bytes. The second load begins 16 bytes early, so that it ends with the run.
 class Bgr24 {
 public:
+    static constexpr int kBytes = 3;
+
     template <class Columns>
     PixelRun operator()(Columns columns, const uint8_t* row, ptrdiff_t x) const {
         const uint8_t* const source = row + 3 * x;
-        Prefetch(source);
-        Prefetch(source + 64);
         const __m512i first = Load(columns, source, 3 * columns.count);
         const __m512i second = Load(columns, source + kSecond, 3 * columns.count - kSecond);
         return {_mm512_permutexvar_epi8(places_, first), _mm512_permutexvar_epi8(placesLater_, second)};
@@ -151,7 +151,10 @@ template <class Form, class Read>
 class To420Step {
 public:
     template <class Columns>
-    void operator()(Columns columns, const PlanesPair& target, RowPair rgb, ptrdiff_t x) const {
+    void operator()(Columns columns, const PlanesPair& target, RowPair rgb, ptrdiff_t x,
+                    ptrdiff_t toNextRows) const {
+        PrefetchRow(rgb.first + Read::kBytes * x + toNextRows, Read::kBytes * kRgbStep);
+        PrefetchRow(rgb.second + Read::kBytes * x + toNextRows, Read::kBytes * kRgbStep);
         const PixelRun upper = read_(columns, rgb.first, x);
         const Components a = convert_(upper.first);
         const Components b = convert_(upper.second);
@@ -189,7 +192,8 @@ void RgbTo420(Planes420 target, Rows rgb, Size size) {
         return (kAvx2Kernels.*kKernel)(target, rgb, size);
     const To420Step<Form, Read> convert;
     ForRowPairs(target, rgb, size.height, [&](PlanesPair to, RowPair from, ptrdiff_t, ptrdiff_t) {
-        ForSteps<kRgbStep>(size.width, [&](ptrdiff_t x, auto columns) { convert(columns, to, from, x); });
+        ForSteps<kRgbStep>(size.width,
+                           [&](ptrdiff_t x, auto columns) { convert(columns, to, from, x, 2 * rgb.step); });
     });
 }
 
@@ -211,7 +215,7 @@ inline void Bgra32To420(Planes420 target, Rows alpha, Rows bgra, Size size) {
         uint8_t* const alpha0 = alpha[row0];
         uint8_t* const alpha1 = alpha[row1];
         ForSteps<kRgbStep>(size.width, [&](ptrdiff_t x, auto columns) {
-            convert(columns, to, from, x);
+            convert(columns, to, from, x, 2 * bgra.step);
             StoreAlpha(columns, alpha0, from.first, x, gather);
             StoreAlpha(columns, alpha1, from.second, x, gather);
         });
@@ -230,6 +234,7 @@ void PackedFromBgr24(Rows packed, Rows rgb, Size size) {
         uint8_t* const target = packed[row];
         const uint8_t* const source = rgb[row];
         ForSteps<kRgbStep>(size.width, [&](ptrdiff_t x, auto columns) {
+            PrefetchRow(source + 3 * x + rgb.step, 3 * kRgbStep);
             const PixelRun run = read(columns, source, x);
             const Components a = convert(run.first);
             const Components b = convert(run.second);

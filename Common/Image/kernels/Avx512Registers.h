@@ -114,12 +114,6 @@ void StoreQuarter(Columns, uint8_t* target, ptrdiff_t bytes, __m128i value) {
         _mm_storeu_si128(reinterpret_cast<__m128i*>(target), value);
 }
 
-/// Asks for what the steps a little further on will read; past the end of a row it does no harm.
-inline void Prefetch(const uint8_t* source) {
-    constexpr int kAhead = 2048;
-    _mm_prefetch(reinterpret_cast<const char*>(source + kAhead), _MM_HINT_T0);
-}
-
 /// Bytes of a register, made at compile time.
 struct alignas(64) Table {
     std::array<uint8_t, 64> bytes;

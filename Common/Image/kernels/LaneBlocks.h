@@ -62,15 +62,6 @@ inline PlanesPair Advance(PlanesPair planes, ptrdiff_t columns) {
     return {Advance(planes.y, columns), planes.u + columns / 2, planes.v + columns / 2};
 }
 
-/// Asks for what the blocks a little further on will read: with two rows read and up to six written, the
-/// processor does not foresee it all. Past the end of a row it does no harm.
-inline void Prefetch(const uint8_t* p, ptrdiff_t blockBytes) {
-    constexpr ptrdiff_t kAhead = 2048;
-    constexpr ptrdiff_t kCacheLine = 64;
-    for (ptrdiff_t i = 0; i < blockBytes; i += kCacheLine)
-        __builtin_prefetch(p + kAhead + i);
-}
-
 /// Stores the bytes of two vectors alternating.
 template <class V>
 void StoreInterleaved(uint8_t* p, typename V::Vec even, typename V::Vec odd) {

@@ -154,9 +154,9 @@ struct LaneFromRgb {
 
     /// `useBytes` is called with the index of each row and its pixels as they were loaded.
     template <class Format, class Form, class UseBytes>
-    static void RgbBlockTo420(PlanesPair target, RowPair rgb, UseBytes useBytes) {
+    static void RgbBlockTo420(PlanesPair target, RowPair rgb, ptrdiff_t toNextRows, UseBytes useBytes) {
         const auto convert = [&](RowIndex index, uint8_t* luma, const uint8_t* row) {
-            Prefetch(row, Format::kBytes * kPixels);
+            PrefetchRow(row + toNextRows, Format::kBytes * kPixels);
             const Quads bytes = Format::Load(row);
             useBytes(index, bytes);
             const Quads pixels = Format::Pixels(bytes);
@@ -178,7 +178,7 @@ struct LaneFromRgb {
                             size.width, kPixels,
                             [&](ptrdiff_t x) {
                                 RgbBlockTo420<Format, Form>(Advance(to, x), Advance(from, Format::kBytes * x),
-                                                            [](RowIndex, const Quads&) {});
+                                                            2 * rgb.step, [](RowIndex, const Quads&) {});
                             },
                             [&](ptrdiff_t x) {
                                 (kPlainKernels.*kKernel)(target.At(x, row0), rgb.At(row0, Format::kBytes * x),
@@ -200,7 +200,7 @@ struct LaneFromRgb {
                                     V::Store(alpha[row == kFirst ? row0 : row1] + x, Bgr32::Alpha(bytes));
                                 };
                                 RgbBlockTo420<Bgr32, FastRgbForm>(Advance(to, x), Advance(from, 4 * x),
-                                                                  storeAlpha);
+                                                                  2 * bgra.step, storeAlpha);
                             },
                             [&](ptrdiff_t x) {
                                 kPlainKernels.bgra32To420(target.At(x, row0), alpha.At(row0, x),
