@@ -222,15 +222,15 @@ void ProbeLength(MovieReader& reader, SourceInfo& info) {
         MeasureDuration(reader, info);
     FindPromise(reader, info, measured);
     const double whole = std::exchange(info.duration, 0);
-    const auto complete = [&](double& duration) {
+    const auto complete = [&](double& duration, std::optional<double> promised) {
         if (duration <= 0 || measured)
-            duration = whole;
+            duration = promised.value_or(whole);
         info.duration = std::max(info.duration, duration);
     };
     if (info.pictures)
-        complete(info.pictures->duration);
+        complete(info.pictures->duration, info.promise.pictures);
     if (info.sound)
-        complete(info.sound->duration);
+        complete(info.sound->duration, info.promise.sound);
 }
 
 } // namespace movieconv

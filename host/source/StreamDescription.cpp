@@ -138,14 +138,21 @@ PictureStreamInfo DescribePictures(AVFormatContext& context, AVStream* stream) {
     return info;
 }
 
+/// Of a layout that tells only how many channels there are, the usual one's.
+std::string LayoutName(const AVChannelLayout& layout) {
+    const av::ChannelLayout usual(layout.nb_channels);
+    char text[64] = "";
+    av_channel_layout_describe(layout.order == AV_CHANNEL_ORDER_UNSPEC ? usual.Get() : &layout, text,
+                               sizeof text);
+    return text;
+}
+
 SoundStreamInfo DescribeSound(const AVStream* stream) {
     const AVCodecParameters& parameters = *stream->codecpar;
     SoundStreamInfo info;
     info.index = stream->index;
     info.codec = avcodec_get_name(parameters.codec_id);
-    char layout[64] = "";
-    av_channel_layout_describe(&parameters.ch_layout, layout, sizeof layout);
-    info.layout = layout;
+    info.layout = LayoutName(parameters.ch_layout);
     info.sampleRate = parameters.sample_rate;
     info.channels = parameters.ch_layout.nb_channels;
     const int storedBits =

@@ -6,6 +6,8 @@
 
 #include <cmath>
 #include <fmt/format.h>
+#include <string_view>
+#include <utility>
 
 namespace movieconv {
 namespace {
@@ -22,17 +24,114 @@ std::string DescribeLength(double seconds, Certainty certainty) {
     return FormatTime(seconds, true);
 }
 
-std::string DescribePictures(const PictureStreamInfo& pictures, Certainty certainty) {
-    std::string text = fmt::format("pictures:  {}, {} x {}, {:.3f} a second, {}, length {}", pictures.codec,
-                                   pictures.width, pictures.height, pictures.frameRate, pictures.pixelFormat,
-                                   DescribeLength(pictures.duration, certainty));
+std::string_view KindName(StreamKind kind) {
+    switch (kind) {
+    case StreamKind::kPictures:
+        return "pictures";
+    case StreamKind::kSound:
+        return "sound";
+    case StreamKind::kSubtitles:
+        return "subtitles";
+    case StreamKind::kCover:
+        return "cover";
+    case StreamKind::kAttachment:
+        return "attachment";
+    case StreamKind::kData:
+        break;
+    }
+    return "data";
+}
+
+std::string DescribeColours(const PictureStreamInfo& pictures) {
+    constexpr int kPerceptualQuantizer = 16; // ISO/IEC 23091-2
+    constexpr int kHybridLogGamma = 18;
+    std::string text = pictures.colorTransfer == kPerceptualQuantizer ? ", HDR (PQ)"
+                       : pictures.colorTransfer == kHybridLogGamma    ? ", HDR (HLG)"
+                                                                      : "";
+    if (pictures.dolbyVision)
+        text += ", Dolby Vision";
+    if (pictures.masteringDisplay) {
+        text += fmt::format(", mastered for {:g} to {:g} cd/m2", pictures.masteringDisplay->darkest,
+                            pictures.masteringDisplay->brightest);
+    }
+    if (pictures.lightLevel) {
+        text += fmt::format(", at most {} cd/m2 ({} on average)", pictures.lightLevel->brightestPixel,
+                            pictures.lightLevel->brightestPicture);
+    }
+    return text + (pictures.fullRange ? ", full range" : "");
+}
+
+std::string DescribePictures(const PictureStreamInfo& pictures) {
+    std::string text = fmt::format(", {} x {}", pictures.width, pictures.height);
+    if (pictures.frameRate > 0)
+        text += fmt::format(", {:.3f} a second", pictures.frameRate);
+    text += fmt::format(", {} ({} bits)", pictures.pixelFormat, pictures.depth);
     if (pictures.pixelAspect.num != pictures.pixelAspect.den)
         text += fmt::format(", pixels {}:{}", pictures.pixelAspect.num, pictures.pixelAspect.den);
     if (pictures.quarterTurns != 0 || pictures.mirrored) {
         text += fmt::format(", {}turned by {} degrees", pictures.mirrored ? "mirrored, " : "",
                             pictures.quarterTurns * 90);
     }
-    return text + (pictures.interlaced ? ", interlaced\n" : "\n");
+    if (pictures.interlaced)
+        text += pictures.topFieldFirst ? ", interlaced (top field first)" : ", interlaced";
+    return text + DescribeColours(pictures);
+}
+
+std::string DescribeFlags(const StreamFlags& flags) {
+    std::string text;
+    const std::pair<bool, const char*> names[] = {{flags.isDefault, "default"},
+                                                  {flags.forced, "forced"},
+                                                  {flags.original, "original language"},
+                                                  {flags.dub, "dubbed"},
+                                                  {flags.commentary, "commentary"},
+                                                  {flags.hearingImpaired, "for the hard of hearing"},
+                                                  {flags.visualImpaired, "for the visually impaired"}};
+    for (const auto& [isSet, name] : names)
+        text += isSet ? fmt::format(", {}", name) : "";
+    return text;
+}
+
+std::string DescribeStream(const StreamInfo& stream, Certainty certainty) {
+    std::string text = fmt::format("{:>4}  {:<10} {}", stream.index, KindName(stream.kind),
+                                   stream.codec == "none" ? stream.fileName : stream.codec);
+    if (!stream.profile.empty())
+        text += fmt::format(" ({})", stream.profile);
+    if (!stream.fileName.empty() && stream.codec != "none")
+        text += fmt::format(", {}", stream.fileName);
+    if (!stream.mimeType.empty())
+        text += fmt::format(", {}", stream.mimeType);
+    if (stream.bytes > 0)
+        text += fmt::format(", {}", FormatBytes(stream.bytes));
+    if (stream.pictures)
+        text += DescribePictures(*stream.pictures);
+    if (stream.sound) {
+        const int channels = stream.sound->channels;
+        text += fmt::format(", {} Hz, {} ({} channel{})", stream.sound->sampleRate, stream.sound->layout,
+                            channels, channels == 1 ? "" : "s");
+    }
+    if (stream.kind == StreamKind::kSubtitles)
+        text += stream.textual ? ", text" : ", bitmaps";
+    if (!stream.language.empty())
+        text += fmt::format(", {}", stream.language);
+    if (!stream.title.empty())
+        text += fmt::format(", \"{}\"", stream.title);
+    text += DescribeFlags(stream.flags);
+    const double length = stream.kind == StreamKind::kPictures ? stream.pictures->duration
+                          : stream.kind == StreamKind::kSound  ? stream.sound->duration
+                                                               : 0;
+    if (length > 0)
+        text += fmt::format(", length {}", DescribeLength(length, certainty));
+    return text +
+           (stream.decodable || stream.kind == StreamKind::kAttachment || stream.kind == StreamKind::kData
+                ? "\n"
+                : ", no decoder\n");
+}
+
+std::string DescribeConverted(const SourceInfo& source) {
+    const auto number = [](const auto& stream) {
+        return stream ? fmt::format("stream {}", stream->index) : std::string("none");
+    };
+    return fmt::format("pictures:  {}\nsound:     {}\n", number(source.pictures), number(source.sound));
 }
 
 template <std::size_t N>
@@ -59,16 +158,15 @@ std::string Describe(const SourceInfo& source) {
     std::string text = fmt::format("file:      {} ({})\ncontainer: {}\nlength:    {}\n", source.path,
                                    FormatBytes(source.bytes), source.container,
                                    DescribeLength(source.duration, source.certainty));
-    text += source.pictures ? DescribePictures(*source.pictures, source.certainty) : "pictures:  none\n";
-    if (source.sound) {
-        const int channels = source.sound->channels;
-        text +=
-            fmt::format("sound:     {}, {} Hz, {} ({} channel{}), length {}\n", source.sound->codec,
-                        source.sound->sampleRate, source.sound->layout, channels, channels == 1 ? "" : "s",
-                        DescribeLength(source.sound->duration, source.certainty));
-    } else {
-        text += "sound:     none\n";
-    }
+    text += DescribeConverted(source) + "streams:\n";
+    for (const StreamInfo& stream : source.streams)
+        text += DescribeStream(stream, source.certainty);
+    text += source.chapters.empty() ? "" : "chapters:\n";
+    for (const Chapter& chapter : source.chapters)
+        text += fmt::format("      {}  {}\n", FormatTime(chapter.begin, true), chapter.title);
+    text += source.tags.empty() ? "" : "tags:\n";
+    for (const Tag& tag : source.tags)
+        text += fmt::format("      {}: {}\n", tag.key, tag.value);
     return text;
 }
 

@@ -11,6 +11,9 @@ namespace movieconv {
 /// The source in a few lines for people.
 std::string Describe(const SourceInfo& source);
 
+/// The same as one JSON object in one line, as docs/progress-json.md describes it.
+std::string DescribeAsJson(const SourceInfo& source);
+
 /// The table of file formats and codecs.
 std::string ListFormats();
 

@@ -61,9 +61,12 @@ ExitCode Perform(const Options& options, const StandardStreams& streams, MainLoo
     case Task::kListFormats:
         PrintWhole(streams, ListFormats());
         return ExitCode::kDone;
-    case Task::kInfo:
-        PrintWhole(streams, Describe(LookAtSource(options.request)));
+    case Task::kInfo: {
+        const SourceInfo source = LookAtSource(options.request);
+        PrintWhole(streams,
+                   options.progress == ProgressStyle::kJson ? DescribeAsJson(source) : Describe(source));
         return ExitCode::kDone;
+    }
     case Task::kEstimate:
         return Estimate(options, streams);
     case Task::kConvert:

@@ -125,6 +125,8 @@ TEST(Source, DescribesEverythingThatItHolds) {
                        "default",
                        "-disposition:a:1",
                        "comment",
+                       "-c:s",
+                       "srt",
                        "-disposition:s:0",
                        "forced",
                        "-attach",
@@ -162,6 +164,23 @@ TEST(Source, DescribesEverythingThatItHolds) {
     ASSERT_EQ(info.tags.size(), 2u);
     EXPECT_EQ(info.tags[0].value, "The whole");
     EXPECT_EQ(info.sound->index, 1);
+
+    const program::Result told = program::Call({"--info", "--progress", "json", path});
+    const char* check = "import json, sys\n"
+                        "info = json.loads(sys.argv[1])\n"
+                        "kinds = [s['kind'] for s in info['streams']]\n"
+                        "assert kinds == ['pictures', 'sound', 'sound', 'subtitles', 'attachment'], kinds\n"
+                        "assert info['streams'][1]['language'] == 'ger' and info['sound'] == 1\n"
+                        "assert info['streams'][2]['flags'] == ['commentary']\n"
+                        "assert info['streams'][0]['transfer'] == 16\n"
+                        "assert info['chapters'][1]['begin_s'] == 1 and info['tags']['ARTIST'] == 'Nobody'\n";
+    EXPECT_EQ(program::Run({"python3", "-c", check, told.out}).code, 0) << told.out;
+    const std::string text = program::Call({"--info", path}).out;
+    for (const char* part :
+         {"h264 (High 10), 160 x 120, 25.000 a second, yuv420p10le (10 bits), HDR (PQ)",
+          "1  sound      pcm_s24le, 44100 Hz, mono (1 channel), ger, default", "\"Director\", commentary",
+          "subrip, text, forced", "font.ttf, font/ttf, 1.0 kB", "0:00:01.000  Second", "The whole"})
+        EXPECT_NE(text.find(part), std::string::npos) << part << " in " << text;
 }
 
 TEST(Source, KeepsACountedRateWhenItsLengthIsMeasured) {
