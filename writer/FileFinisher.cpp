@@ -24,6 +24,7 @@ constexpr double kTellStep = 0.02;
 
 void FileFinisher::Finish() {
     Progress(kDrainedShare);
+    part_.Streams().SetChapters(extras_.chapters);
     part_.WriteTrailer();
     TellLengths();
     if (plan_.Fragmented())
@@ -73,7 +74,7 @@ void FileFinisher::FinishFragments() {
 
 void FileFinisher::JoinInto(const std::string& path, const std::shared_ptr<ByteFile>& file) {
     AvioFile out(file, AvioFile::Mode::kWrite);
-    JoinFragments(part_.File(), part_.Streams(), *plan_.container, out, plan_.bitExact,
+    JoinFragments(part_.File(), part_.Streams(), *plan_.container, out, plan_.bitExact, extras_,
                   [this](double share) { Progress(kDrainedShare + (kCopiedShare - kDrainedShare) * share); });
     if (const int error = out.Flush(); error != 0)
         throw SystemFailure(kWriterErrorWrite, error, "Writing to \"%s\" failed", path.c_str());

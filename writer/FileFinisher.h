@@ -10,6 +10,7 @@
 
 #include <memory>
 #include <string>
+#include <utility>
 
 namespace writer {
 
@@ -19,6 +20,9 @@ public:
     FileFinisher(PartFile& part, const std::string& target, const FilePlan& plan, FileRecord& record,
                  FileSystem& files)
         : part_(part), target_(target), plan_(plan), record_(record), files_(files) {}
+
+    /// What the file carries, chapters on its own timeline.
+    void SetExtras(Extras extras) { extras_ = std::move(extras); }
 
     /// Writes the end, gives files of the MP4 family one index, syncs, and renames. Throws WriterFailure.
     void Finish();
@@ -38,6 +42,7 @@ private:
     const FilePlan& plan_;
     FileRecord& record_;
     FileSystem& files_;
+    Extras extras_;
     double toldShare_ = 0;
 };
 

@@ -7,11 +7,13 @@
 #include <cstdarg>
 #include <cstdio>
 #include <exception>
+#include <utility>
 
 namespace writer {
 
-FileRecord::FileRecord(uint32_t set, int sequence, std::string_view path, const WriterOptions& options)
-    : sequence_(sequence), options_(options) {
+FileRecord::FileRecord(uint32_t set, int sequence, std::string_view path, const WriterOptions& options,
+                       std::shared_ptr<const Extras> extras)
+    : sequence_(sequence), options_(options), extras_(std::move(extras)) {
     status_.nSet = set;
     status_.nSequence = sequence;
     status_.nState = kWriterFileWriting;

@@ -2,10 +2,12 @@
 #ifndef MOVIECONV_WRITER_FILERECORD_H
 #define MOVIECONV_WRITER_FILERECORD_H
 
+#include "writer/Extras.h"
 #include "writer/WriterFailure.h"
 #include "writer/WriterStatus.h"
 
 #include <cstdint>
+#include <memory>
 #include <mutex>
 #include <string_view>
 
@@ -14,9 +16,11 @@ namespace writer {
 /// The status of one file. Thread-safe; the listener is never called under a lock.
 class FileRecord {
 public:
-    FileRecord(uint32_t set, int sequence, std::string_view path, const WriterOptions& options);
+    FileRecord(uint32_t set, int sequence, std::string_view path, const WriterOptions& options,
+               std::shared_ptr<const Extras> extras);
 
     const WriterOptions& Options() const { return options_; }
+    const std::shared_ptr<const Extras>& ExtraParts() const { return extras_; }
     int Sequence() const { return sequence_; }
 
     WriterStatus Snapshot() const;
@@ -44,6 +48,7 @@ public:
 private:
     const int sequence_;
     const WriterOptions options_;
+    const std::shared_ptr<const Extras> extras_;
     mutable std::mutex mutex_;
     WriterStatus status_{};
 };

@@ -60,26 +60,42 @@ constexpr std::array kSoundCodecs{
 };
 
 using enum ContainerKind;
+constexpr uint32_t kTags = kWriterFormatTags;
+constexpr uint32_t kChapters = kWriterFormatChapters;
+constexpr uint32_t kCover = kWriterFormatCover;
+constexpr uint32_t kFiles = kWriterFormatAttachments;
 constexpr const char* kClusters = "cluster_time_limit=1000"; // what is lost at most when a file is cut off
 constexpr std::array kContainers{
     Container{FourCC("MP4 "), "MP4 (MPEG-4 Part 14)", "mp4,m4v", "mp4", kFragmented, nullptr,
+              kTags | kChapters | kCover, false,
               {kXvid, kH264, kHevc, kMjpg, kVp9, kMpeg2}, {kAac, kMp3, kAc3, kOpus, kVorbis}},
     Container{FourCC("MOV "), "QuickTime", "mov,qt", "mov", kFragmented, nullptr,
+              kTags | kChapters, false,
               {kXvid, kH264, kHevc, kMjpg, kMpeg2}, {kAac, kMp3, kAc3, kPcm}},
     Container{FourCC("MKV "), "Matroska", "mkv", "matroska", kStreamed, kClusters,
+              kTags | kChapters | kCover | kFiles, false,
               {kXvid, kH264, kHevc, kMjpg, kVp8, kVp9, kMpeg2, kFlv1},
               {kAac, kMp3, kAc3, kFlac, kOpus, kVorbis, kPcm}},
     Container{FourCC("AVI "), "AVI (Audio Video Interleaved)", "avi,divx", "avi", kSteadyRate, nullptr,
+              kTags, false,
               {kXvid, kH264, kMjpg, kVp8, kMpeg2, kFlv1}, {kMp3, kAac, kAc3, kPcm}},
-    Container{FourCC("WEBM"), "WebM", "webm", "webm", kStreamed, kClusters, {kVp8, kVp9}, {kVorbis, kOpus}},
-    Container{FourCC("FLV "), "Flash Video", "flv", "flv", kStreamed, nullptr, {kH264, kFlv1}, {kAac, kMp3}},
+    Container{FourCC("WEBM"), "WebM", "webm", "webm", kStreamed, kClusters,
+              kTags | kChapters, false, {kVp8, kVp9}, {kVorbis, kOpus}},
+    Container{FourCC("FLV "), "Flash Video", "flv", "flv", kStreamed, nullptr,
+              kTags, false, {kH264, kFlv1}, {kAac, kMp3}},
     Container{FourCC("TS  "), "MPEG transport stream", "ts,m2ts,mts", "mpegts", kStreamed, nullptr,
+              kTags, false,
               {kH264, kHevc, kXvid, kMpeg2}, {kAac, kMp3, kAc3, kOpus}},
-    Container{FourCC("M4A "), "MPEG-4 audio", "m4a,m4b", "ipod", kFragmented, nullptr, {}, {kAac, kAc3}},
-    Container{FourCC("MP3 "), "MP3", "mp3", "mp3", kStreamed, nullptr, {}, {kMp3}},
-    Container{FourCC("WAV "), "WAV (RIFF wave)", "wav", "wav", kSteadyRate, "rf64=auto", {}, {kPcm, kMp3, kAc3}},
-    Container{FourCC("FLAC"), "FLAC", "flac", "flac", kStreamed, nullptr, {}, {kFlac}},
-    Container{FourCC("OGG "), "Ogg", "ogg,oga,opus", "ogg", kStreamed, nullptr, {}, {kVorbis, kOpus, kFlac}},
+    Container{FourCC("M4A "), "MPEG-4 audio", "m4a,m4b", "ipod", kFragmented, nullptr,
+              kTags | kChapters | kCover, false, {}, {kAac, kAc3}},
+    Container{FourCC("MP3 "), "MP3", "mp3", "mp3", kStreamed, nullptr,
+              kTags | kCover, false, {}, {kMp3}},
+    Container{FourCC("WAV "), "WAV (RIFF wave)", "wav", "wav", kSteadyRate, "rf64=auto",
+              kTags, false, {}, {kPcm, kMp3, kAc3}},
+    Container{FourCC("FLAC"), "FLAC", "flac", "flac", kStreamed, nullptr,
+              kTags | kCover, false, {}, {kFlac}},
+    Container{FourCC("OGG "), "Ogg", "ogg,oga,opus", "ogg", kStreamed, nullptr,
+              kTags, true, {}, {kVorbis, kOpus, kFlac}},
 };
 
 constexpr std::array kFlashRates{44100, 22050, 11025, 0};
@@ -201,8 +217,10 @@ const Carriage& FindCarriage(const Container& container, uint32_t codec) {
 
 uint32_t FormatTraits(uint32_t code) {
     const Container* container = FindContainer(code);
-    return container != nullptr && container->kind == ContainerKind::kSteadyRate ? kWriterFormatSteadyRate
-                                                                                 : 0;
+    if (container == nullptr)
+        return 0;
+    return container->carries |
+           (container->kind == ContainerKind::kSteadyRate ? uint32_t{kWriterFormatSteadyRate} : 0U);
 }
 
 std::string CodeText(uint32_t code) {

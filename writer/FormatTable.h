@@ -65,6 +65,8 @@ struct Container {
     const char* muxer;
     ContainerKind kind;
     const char* options;            ///< The multiplexer's own, as "name=value,...".
+    uint32_t carries;               ///< kWriterFormat... of what goes in beside pictures and sound.
+    bool tagsInStream;              ///< Texts about the movie belong to its stream.
     std::array<uint32_t, 10> video; ///< Codes of the codecs that fit, the default first, then zeros.
     std::array<uint32_t, 10> audio;
 };

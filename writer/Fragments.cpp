@@ -76,7 +76,8 @@ Box ReadBox(ByteFile& file, int64_t position) {
 } // namespace
 
 void JoinFragments(const std::shared_ptr<ByteFile>& part, const Muxer& written, const Container& container,
-                   AvioFile& out, bool bitExact, const std::function<void(double)>& progress) {
+                   AvioFile& out, bool bitExact, const Extras& extras,
+                   const std::function<void(double)>& progress) {
     const int64_t end = part->Seek(0, SEEK_END);
     if (WholeFragments(*part, end) != end)
         ThrowIncomplete();
@@ -84,8 +85,9 @@ void JoinFragments(const std::shared_ptr<ByteFile>& part, const Muxer& written, 
     const av::Input input = OpenMovie(file, kWriterErrorFinish);
     if (static_cast<int>(input->nb_streams) != written.StreamCount())
         ThrowIncomplete();
-    Muxer joined(container, out, false, bitExact);
+    Muxer joined(container, out, false, bitExact, extras);
     AddStreams(*input, written, joined);
+    joined.SetChapters(extras.chapters);
     joined.WriteHeader();
     const av::Packet packet = av::NewPacket();
     const auto size = static_cast<double>(std::max<int64_t>(1, file.Size()));

@@ -11,10 +11,12 @@
 namespace writer {
 
 /// Writes the movie in the fragmented file `part`, written by `written`, into `out` once more with a single
-/// index. Times are those that went into `written`. `progress` is told the share done, 0 to 1. Throws
+/// index, with `extras`, whose chapters are on the file's timeline. Times are
+/// those that went into `written`. `progress` is told the share done, 0 to 1. Throws
 /// WriterFailure, with kWriterErrorFinish when `part` cannot be read or does not hold all that was written.
 void JoinFragments(const std::shared_ptr<ByteFile>& part, const Muxer& written, const Container& container,
-                   AvioFile& out, bool bitExact, const std::function<void(double)>& progress);
+                   AvioFile& out, bool bitExact, const Extras& extras,
+                   const std::function<void(double)>& progress);
 
 /// Throws WriterFailure when the index of `file` does not name all that `written` took: the multiplexer
 /// leaves out without a word what it has no memory for.

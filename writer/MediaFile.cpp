@@ -5,7 +5,9 @@
 
 #include <algorithm>
 #include <cerrno>
+#include <cmath>
 #include <cstdlib>
+#include <cstring>
 #include <utility>
 
 namespace writer {
@@ -21,6 +23,13 @@ bool Usable(const VideoImage& image) {
            image.nWidth > 0 && image.nHeight > 0 && image.nWidth <= 32768 && image.nHeight <= 32768 &&
            std::abs(image.nPitchY) >= image.nWidth && std::abs(image.nPitchU) >= (image.nWidth + 1) / 2 &&
            std::abs(image.nPitchV) >= (image.nWidth + 1) / 2;
+}
+
+/// What the host says in a record's reserved bytes about its place in the source.
+std::optional<int64_t> SourceTime(const unsigned char* reserved) {
+    WriterSourceTime time{};
+    std::memcpy(&time, reserved, sizeof time);
+    return time.nTag == kWriterSourceTimeTag ? std::optional(time.llTime) : std::nullopt;
 }
 
 PcmFormat FormatOf(const AudioFrame& frame) {
@@ -122,7 +131,10 @@ bool MediaFile::WriteVideo(const VideoImage& image) {
     if (!pictures_ || !Usable(image) || record_->Failed())
         return false;
     const int64_t time = stamps_.AddPicture(image.llTime);
-    firstPicture_ = firstPicture_.value_or(time);
+    if (!firstPicture_) {
+        firstPicture_ = time;
+        sourceBegin_ = SourceTime(image.reserved);
+    }
     record_->Update([&](WriterStatus& status) {
         ++status.llPicturesReceived;
         status.llStampsRepaired = stamps_.Repairs();
@@ -151,6 +163,8 @@ bool MediaFile::WriteAudio(const AudioFrame& frame) {
 }
 
 bool MediaFile::AddSound(const AudioFrame& frame, const PcmFormat& format) {
+    if (!pictures_ && !sourceBegin_)
+        sourceBegin_ = SourceTime(frame.reserved);
     stamps_.AddSound(frame.llTime, frame.nLength, format.BytesPerSecond(), frame.nType == kMediaTypeSilence);
     record_->Update([&](WriterStatus& status) {
         status.llSamplesReceived += frame.nLength / format.BytesPerFrame();
@@ -224,6 +238,7 @@ int MediaFile::Conclude() {
     FileFinisher finisher(part_, target_, plan_, *record_, files_);
     if (!record_->Failed()) {
         try {
+            finisher.SetExtras(FinalExtras());
             finisher.Finish();
             return kWriterFileComplete;
         } catch (...) {
@@ -232,6 +247,19 @@ int MediaFile::Conclude() {
     }
     finisher.Abandon();
     return kWriterFileFailed;
+}
+
+/// What the file carries, with the chapters that lie in it, on its own timeline.
+Extras MediaFile::FinalExtras() const {
+    Extras extras = *record_->ExtraParts();
+    const WriterStatus status = record_->Snapshot();
+    const int64_t start = firstPicture_ ? *firstPicture_ : stamps_.SoundStart().value_or(0);
+    const int64_t shift = sourceBegin_ ? *sourceBegin_ - start : 0;
+    const double end =
+        std::max(static_cast<double>(firstPicture_.value_or(0)) / kTicksPerSecond + status.dVideoReceived,
+                 status.dAudioReceived);
+    extras.chapters = ChaptersWithin(extras.chapters, shift, std::llround(end * kTicksPerSecond));
+    return extras;
 }
 
 bool MediaFile::Empty() const {

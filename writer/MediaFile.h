@@ -61,6 +61,7 @@ private:
     void DrainStages();
     int Conclude();
     bool Empty() const;
+    Extras FinalExtras() const;
 
     const FilePlan plan_;
     const std::string target_;
@@ -74,6 +75,8 @@ private:
         waiting_; ///< Sound whose place is not known yet, or too short a stretch to hand on.
     bool soundStarted_ = false;
     std::optional<int64_t> firstPicture_; ///< Its time in the file.
+    std::optional<int64_t>
+        sourceBegin_; ///< Where the first picture, or the sound alone, stood in the source.
     std::unique_ptr<PictureStage> pictures_;
     std::unique_ptr<SoundStage> sound_;
 };

@@ -14,6 +14,7 @@
 
 namespace {
 
+using writer::Extras;
 using writer::FileRecord;
 using writer::MediaFile;
 using writer::OptionSet;
@@ -63,6 +64,15 @@ MediaFile* Create(const wchar_t* fileName, const EncodeParam* param, const Video
 
 int CopyStatus(const std::shared_ptr<const FileRecord>& record, WriterStatus* status) {
     return record && writer::CopyStatus(record->Snapshot(), status) ? 1 : 0;
+}
+
+/// Changes what the files of a set carry; 1 when `change` did.
+template <typename Change>
+int ChangeExtras(uint32_t number, Change change) noexcept {
+    return Guarded(0, [&] {
+        const std::shared_ptr<OptionSet> set = OptionSets::Instance().Find(number);
+        return set && set->ChangeExtras(change) ? 1 : 0;
+    });
 }
 
 /// What `call` gives of the set; 0 when there is none of that number.
@@ -138,6 +148,45 @@ int MWSetOptions(uint32_t set, const WriterOptions* options) {
 
 int MWUnregisterOptions(uint32_t set) {
     return Guarded(0, [&] { return OptionSets::Instance().Unregister(set) ? 1 : 0; });
+}
+
+int MWSetTag(uint32_t set, const char* key, const char* value) {
+    return ChangeExtras(set, [&](Extras& extras) { return writer::SetTag(extras.tags, key, value); });
+}
+
+int MWSetTrackTag(uint32_t set, int forSound, const char* key, const char* value) {
+    return ChangeExtras(set, [&](Extras& extras) {
+        return writer::SetTag(forSound != 0 ? extras.soundTags : extras.pictureTags, key, value);
+    });
+}
+
+int MWAddChapter(uint32_t set, int64_t begin, int64_t end, const char* title) {
+    return ChangeExtras(set, [&](Extras& extras) {
+        if (end <= begin)
+            return false;
+        extras.chapters.push_back({begin, end, title != nullptr ? title : ""});
+        return true;
+    });
+}
+
+int MWSetCover(uint32_t set, const void* data, int64_t size) {
+    return ChangeExtras(set, [&](Extras& extras) {
+        extras.cover = writer::MakeCover(data, size);
+        return extras.cover.codec != AV_CODEC_ID_NONE;
+    });
+}
+
+int MWAddAttachment(uint32_t set, const char* fileName, const char* mimeType, const void* data,
+                    int64_t size) {
+    return ChangeExtras(set, [&](Extras& extras) {
+        if (fileName == nullptr || *fileName == '\0' || mimeType == nullptr || data == nullptr || size <= 0 ||
+            size > INT32_MAX)
+            return false;
+        const auto* bytes = static_cast<const uint8_t*>(data);
+        extras.attachments.push_back(
+            {fileName, mimeType, std::make_shared<std::vector<uint8_t>>(bytes, bytes + size)});
+        return true;
+    });
 }
 
 int MWGetFileCount(uint32_t set) {

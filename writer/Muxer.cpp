@@ -1,5 +1,6 @@
 #include "writer/Muxer.h"
 
+#include "media/MediaRecords.h"
 #include "thread/Stall.h"
 #include "writer/WriterFailure.h"
 #include "writer/WriterStatus.h"
@@ -43,6 +44,11 @@ void SetOption(AVFormatContext& output, const char* name, const std::string& val
     av::CheckMemory(av_opt_set(&output, name, value.c_str(), AV_OPT_SEARCH_CHILDREN));
 }
 
+void SetTags(AVDictionary*& metadata, const Tags& tags) {
+    for (const auto& [key, value] : tags)
+        av::CheckMemory(av_dict_set(&metadata, key.c_str(), value.c_str(), 0));
+}
+
 void SetFragments(AVFormatContext& output, bool describedByPacket) {
     // Times are written as they are, from the first fragment on.
     std::string flags = "empty_moov+default_base_moof+frag_discont";
@@ -61,8 +67,8 @@ void SetFragments(AVFormatContext& output, bool describedByPacket) {
 
 } // namespace
 
-Muxer::Muxer(const Container& container, AvioFile& file, bool fragmented, bool bitExact)
-    : container_(container), file_(file), fragmented_(fragmented), packet_(av::NewPacket()) {
+Muxer::Muxer(const Container& container, AvioFile& file, bool fragmented, bool bitExact, const Extras& extras)
+    : container_(container), file_(file), fragmented_(fragmented), extras_(extras), packet_(av::NewPacket()) {
     AVFormatContext* output = nullptr;
     const int error = avformat_alloc_output_context2(&output, nullptr, container.muxer, nullptr);
     output_.reset(output);
@@ -71,6 +77,8 @@ Muxer::Muxer(const Container& container, AvioFile& file, bool fragmented, bool b
     output_->flags |= AVFMT_FLAG_CUSTOM_IO;
     if (bitExact)
         output_->flags |= AVFMT_FLAG_BITEXACT;
+    if (Carries(kWriterFormatTags))
+        SetTags(output_->metadata, extras.tags);
 }
 
 int Muxer::AddStream(const MuxedStream& stream) {
@@ -78,6 +86,12 @@ int Muxer::AddStream(const MuxedStream& stream) {
     if (made == nullptr)
         throw std::bad_alloc();
     Check(avcodec_parameters_copy(made->codecpar, stream.parameters), "does not take a stream");
+    if (Carries(kWriterFormatTags)) {
+        const bool isSound = stream.parameters->codec_type == AVMEDIA_TYPE_AUDIO;
+        SetTags(made->metadata, isSound ? extras_.soundTags : extras_.pictureTags);
+        if (container_.tagsInStream)
+            SetTags(made->metadata, extras_.tags);
+    }
     made->codecpar->codec_tag = stream.carriage->tag;
     made->time_base = stream.unit;
     made->avg_frame_rate = stream.rate;
@@ -88,7 +102,12 @@ int Muxer::AddStream(const MuxedStream& stream) {
 
 void Muxer::WriteHeader() {
     SetOptions();
+    if (Carries(kWriterFormatAttachments))
+        AddAttachments();
+    if (Carries(kWriterFormatCover) && !fragmented_)
+        AddCover();
     Check(avformat_write_header(output_.get(), nullptr), "refuses its header");
+    WriteCover();
     NoteWhole();
     if (fragmented_)
         SetDelays();
@@ -105,6 +124,76 @@ void Muxer::SetOptions() {
     } else if (container_.kind == ContainerKind::kSteadyRate) {
         SetOption(*output_, "avoid_negative_ts",
                   "disabled"); // Moving pictures by less than one would lose one.
+    }
+}
+
+void Muxer::AddAttachments() {
+    const auto add = [this](const std::string& name, const std::string& mimeType, const Bytes& data) {
+        AVStream* made = avformat_new_stream(output_.get(), nullptr);
+        if (made == nullptr)
+            throw std::bad_alloc();
+        made->codecpar->codec_type = AVMEDIA_TYPE_ATTACHMENT;
+        made->codecpar->extradata =
+            static_cast<uint8_t*>(av_mallocz(data->size() + AV_INPUT_BUFFER_PADDING_SIZE));
+        if (made->codecpar->extradata == nullptr)
+            throw std::bad_alloc();
+        std::copy(data->begin(), data->end(), made->codecpar->extradata);
+        made->codecpar->extradata_size = static_cast<int>(data->size());
+        SetTags(made->metadata, {{"filename", name}, {"mimetype", mimeType}});
+    };
+    if (extras_.cover.codec == AV_CODEC_ID_PNG)
+        add("cover.png", "image/png", extras_.cover.data);
+    else if (extras_.cover.codec == AV_CODEC_ID_MJPEG)
+        add("cover.jpg", "image/jpeg", extras_.cover.data);
+    for (const Attachment& attachment : extras_.attachments)
+        add(attachment.fileName, attachment.mimeType, attachment.data);
+}
+
+/// As a stream of one picture, for containers without attachments.
+void Muxer::AddCover() {
+    if (extras_.cover.codec == AV_CODEC_ID_NONE || Carries(kWriterFormatAttachments))
+        return;
+    AVStream* made = avformat_new_stream(output_.get(), nullptr);
+    if (made == nullptr)
+        throw std::bad_alloc();
+    made->codecpar->codec_type = AVMEDIA_TYPE_VIDEO;
+    made->codecpar->codec_id = extras_.cover.codec;
+    made->codecpar->width = extras_.cover.width;
+    made->codecpar->height = extras_.cover.height;
+    made->disposition = AV_DISPOSITION_ATTACHED_PIC;
+    made->time_base = {1, 90000};
+    coverStream_ = made->index;
+}
+
+void Muxer::WriteCover() {
+    if (coverStream_ < 0)
+        return;
+    const std::vector<uint8_t>& data = *extras_.cover.data;
+    const av::Packet cover = av::NewPacket();
+    av::CheckMemory(av_new_packet(cover.get(), static_cast<int>(data.size())));
+    std::copy(data.begin(), data.end(), cover->data);
+    cover->stream_index = coverStream_;
+    cover->pts = cover->dts = 0;
+    cover->flags |= AV_PKT_FLAG_KEY;
+    Check(av_write_frame(output_.get(), cover.get()), "refuses its cover");
+}
+
+void Muxer::SetChapters(const std::vector<Chapter>& chapters) {
+    if (!Carries(kWriterFormatChapters) || fragmented_ || chapters.empty())
+        return;
+    output_->chapters = static_cast<AVChapter**>(av_calloc(chapters.size(), sizeof(AVChapter*)));
+    if (output_->chapters == nullptr)
+        throw std::bad_alloc();
+    for (const Chapter& chapter : chapters) {
+        auto* made = static_cast<AVChapter*>(av_mallocz(sizeof(AVChapter)));
+        if (made == nullptr)
+            throw std::bad_alloc();
+        output_->chapters[output_->nb_chapters++] = made;
+        made->id = output_->nb_chapters;
+        made->time_base = {1, kTicksPerSecond};
+        made->start = chapter.begin;
+        made->end = chapter.end;
+        SetTags(made->metadata, {{"title", chapter.title}});
     }
 }
 
@@ -152,7 +241,12 @@ void Muxer::Write(AVPacket& packet, int stream) {
     packet_->stream_index = stream;
     const int64_t time = av_rescale_q(packet_->dts, out->time_base, AV_TIME_BASE_Q);
     output_->max_interleave_delta = MostApart(packet_->size);
-    Check(av_interleaved_write_frame(output_.get(), packet_.get()), "refuses a packet");
+    // A cover never gets a second packet, for which the multiplexer would wait.
+    const bool alone = coverStream_ >= 0 && streams_.size() == 1;
+    Check(alone ? av_write_frame(output_.get(), packet_.get())
+                : av_interleaved_write_frame(output_.get(), packet_.get()),
+          "refuses a packet");
+    av_packet_unref(packet_.get());
     ++state.packets;
     NoteWhole();
     FlushNowAndThen(time);

@@ -4,6 +4,7 @@
 
 #include "ffmpeg/AvHandles.h"
 #include "writer/AvioFile.h"
+#include "writer/Extras.h"
 #include "writer/FormatTable.h"
 
 #include <condition_variable>
@@ -30,12 +31,17 @@ public:
     /// `fragmented`: the file can be played up to wherever it ends, at the price of an index spread all over
     /// it. All functions throw WriterFailure (kWriterErrorEncode) or std::bad_alloc; where `file` has failed,
     /// its error is the real reason.
-    Muxer(const Container& container, AvioFile& file, bool fragmented, bool bitExact);
+    /// The file gets what the container carries of `extras`, read as long as the muxer lives: tags with the
+    /// header, cover and attachments too where it is not fragmented, chapters by SetChapters.
+    Muxer(const Container& container, AvioFile& file, bool fragmented, bool bitExact, const Extras& extras);
 
     /// Returns the stream's number, from 0 on. A fragmented file cannot express times below 0: all its times
     /// are later by the longest run-up.
     int AddStream(const MuxedStream& stream);
     void WriteHeader();
+
+    /// Chapters on the file's timeline, before its end; where it is fragmented, it takes none.
+    void SetChapters(const std::vector<Chapter>& chapters);
 
     /// Takes the packet's content. Times are in the stream's unit; those of decoding must not fall.
     void Write(AVPacket& packet, int stream);
@@ -62,6 +68,7 @@ public:
     /// Whether no packet was taken yet.
     bool Empty() const;
 
+    /// Streams that were added, without those of covers and attachments.
     int StreamCount() const { return static_cast<int>(streams_.size()); }
 
 private:
@@ -82,6 +89,10 @@ private:
     static void NoteTimes(State& state, const AVPacket& packet);
     void Check(int result, const char* what) const;
     void SetOptions();
+    bool Carries(uint32_t what) const { return (container_.carries & what) != 0; }
+    void AddAttachments();
+    void AddCover();
+    void WriteCover();
     void SetDelays();
     int64_t MostApart(int packetSize);
     void NoteWhole();
@@ -90,6 +101,8 @@ private:
     const Container& container_;
     AvioFile& file_;
     const bool fragmented_;
+    const Extras& extras_;
+    int coverStream_ = -1;
     av::Output output_;
     av::Packet packet_;
     // Whether one has its Turn, which guards everything once the header is written.

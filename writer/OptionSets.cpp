@@ -54,7 +54,7 @@ WriterOptions OptionSet::Options() const {
 
 std::shared_ptr<FileRecord> OptionSet::Open(std::string_view path) {
     const std::lock_guard lock(mutex_);
-    auto record = std::make_shared<FileRecord>(number_, count_ + 1, path, options_);
+    auto record = std::make_shared<FileRecord>(number_, count_ + 1, path, options_, extras_);
     records_.push_back(record);
     ++count_;
     ForgetOld();

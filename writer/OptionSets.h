@@ -3,6 +3,7 @@
 #define MOVIECONV_WRITER_OPTIONSETS_H
 
 #include "media/EncodeParam.h"
+#include "writer/Extras.h"
 #include "writer/FileRecord.h"
 #include "writer/WriterStatus.h"
 
@@ -12,6 +13,7 @@
 #include <mutex>
 #include <optional>
 #include <string_view>
+#include <utility>
 #include <vector>
 
 namespace writer {
@@ -31,11 +33,22 @@ public:
     void SetOptions(const WriterOptions& options);
     WriterOptions Options() const;
 
+    /// Changes what files carry that are opened from now on; `change` tells whether it did.
+    template <typename Change>
+    bool ChangeExtras(Change change) {
+        const std::lock_guard lock(mutex_);
+        auto changed = std::make_shared<Extras>(*extras_);
+        if (!change(*changed))
+            return false;
+        extras_ = std::move(changed);
+        return true;
+    }
+
     /// Gives the next number of this set to a file named `path`.
     std::shared_ptr<FileRecord> Open(std::string_view path);
 
     /// Told on a record that is in no list, where there is no memory for one that is.
-    FileRecord Unlisted() const { return {number_, 0, "", Options()}; }
+    FileRecord Unlisted() const { return {number_, 0, "", Options(), nullptr}; }
 
     int Count() const;
 
@@ -51,6 +64,7 @@ private:
     const uint32_t number_;
     mutable std::mutex mutex_;
     WriterOptions options_;
+    std::shared_ptr<const Extras> extras_ = std::make_shared<Extras>();
     int count_ = 0;
     std::vector<std::shared_ptr<FileRecord>> records_; ///< Rising numbers.
 };

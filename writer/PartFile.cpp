@@ -21,7 +21,8 @@ PartFile::PartFile(const std::string& target, const FilePlan& plan, std::shared_
     try {
         io_ = std::make_unique<AvioFile>(std::move(file), AvioFile::Mode::kWrite,
                                          [this] { return record_->AskAboutFullDisk(); });
-        muxer_ = std::make_unique<Muxer>(*plan.container, *io_, plan.Fragmented(), plan.bitExact);
+        muxer_ = std::make_unique<Muxer>(*plan.container, *io_, plan.Fragmented(), plan.bitExact,
+                                         *record_->ExtraParts());
     } catch (...) {
         files_.Remove(path_);
         throw;

@@ -151,7 +151,11 @@ typedef struct WriterOptions {
 /// What distinguishes a file format beside what FileFormatInfo says.
 enum {
     /// The file has one picture rate and knows no other times: what comes faster is left out.
-    kWriterFormatSteadyRate = 1
+    kWriterFormatSteadyRate = 1,
+    kWriterFormatTags = 2,        ///< Carries texts about the movie, as many as the format knows.
+    kWriterFormatChapters = 4,    ///< Carries chapters.
+    kWriterFormatCover = 8,       ///< Carries a cover picture.
+    kWriterFormatAttachments = 16 ///< Carries attached files, such as fonts.
 };
 
 /// kWriterFormat... of the format with that code, together; 0 for one that is not in the table.
@@ -171,6 +175,40 @@ int MWSetOptions(uint32_t set, const WriterOptions* options);
 /// whose parameters name the set is refused from now on. Returns 1; 0 when there is no such set, or when it
 /// is the default one.
 int MWUnregisterOptions(uint32_t set);
+
+/// Where a picture or a block of sound stands in its source: the first bytes of `reserved` in VideoImage and
+/// AudioFrame, packed. A host that writes clips or a part of its source tells it, so that chapters can be
+/// placed; without it, the source's time is taken for the file's.
+#pragma pack(push, 4)
+typedef struct WriterSourceTime {
+    uint32_t nTag;  ///< kWriterSourceTimeTag.
+    int64_t llTime; ///< 100 ns units from the start of the source.
+} WriterSourceTime;
+#pragma pack(pop)
+
+enum { kWriterSourceTimeTag = 0x4D495453 };
+
+/// What a movie carries beside pictures and sound. It belongs to a set and goes into each file that is
+/// created with it from then on, as far as the format carries it (see MWGetFormatTraits). All of these
+/// functions copy what they are given and return 1; 0 when there is no such set, the arguments make no sense,
+/// or there is no memory.
+///
+/// A text about the movie: `key` as FFmpeg calls it, such as "title", "artist", "date", "comment",
+/// "creation_time" (ISO 8601), or as the format has it. Null or an empty value takes the text away.
+int MWSetTag(uint32_t set, const char* key, const char* value);
+
+/// The same about its pictures (`forSound` 0) or its sound, such as "language" (ISO 639-2) or "title".
+int MWSetTrackTag(uint32_t set, int forSound, const char* key, const char* value);
+
+/// A chapter, in the source's time (100 ns units). Each file gets what lies in it, on its own timeline, when
+/// it is closed. `title` may be null.
+int MWAddChapter(uint32_t set, int64_t begin, int64_t end, const char* title);
+
+/// A cover, as JPEG or PNG; a second call replaces it. In MP4, MOV and M4A it comes with the close.
+int MWSetCover(uint32_t set, const void* data, int64_t size);
+
+/// An attached file.
+int MWAddAttachment(uint32_t set, const char* fileName, const char* mimeType, const void* data, int64_t size);
 
 /// Files of the set created so far, refused ones counted: the highest sequence number. 0 without such a set.
 int MWGetFileCount(uint32_t set);

@@ -54,7 +54,7 @@ private:
 class SoundFile {
 public:
     SoundFile(const char (&format)[5], AVCodecID codec)
-        : muxer_(*writer::FindContainer(FourCC(format)), io_, false, true) {
+        : muxer_(*writer::FindContainer(FourCC(format)), io_, false, true, extras_) {
         const av::CodecParameters parameters(avcodec_parameters_alloc());
         parameters->codec_type = AVMEDIA_TYPE_AUDIO;
         parameters->codec_id = codec;
@@ -86,6 +86,7 @@ public:
     }
 
 private:
+    const writer::Extras extras_;
     std::shared_ptr<Beginning> file_ = std::make_shared<Beginning>();
     writer::AvioFile io_{file_, writer::AvioFile::Mode::kWrite};
     writer::Muxer muxer_;

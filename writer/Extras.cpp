@@ -1,0 +1,86 @@
+#include "writer/Extras.h"
+
+#include <algorithm>
+#include <array>
+#include <cstring>
+#include <optional>
+
+namespace writer {
+namespace {
+
+struct Size {
+    int width;
+    int height;
+};
+
+int Number(const uint8_t* bytes, int count) {
+    int value = 0;
+    for (int i = 0; i < count; ++i)
+        value = value << 8 | bytes[i];
+    return value;
+}
+
+std::optional<Size> PngSize(const std::vector<uint8_t>& data) {
+    static constexpr std::array<uint8_t, 8> kSignature{0x89, 'P', 'N', 'G', '\r', '\n', 0x1A, '\n'};
+    if (data.size() < 24 || !std::equal(kSignature.begin(), kSignature.end(), data.begin()))
+        return std::nullopt;
+    return Size{Number(&data[16], 4), Number(&data[20], 4)};
+}
+
+/// Its first frame header tells.
+std::optional<Size> JpegSize(const std::vector<uint8_t>& data) {
+    if (data.size() < 4 || data[0] != 0xFF || data[1] != 0xD8)
+        return std::nullopt;
+    for (size_t at = 2; at + 9 < data.size() && data[at] == 0xFF;) {
+        const uint8_t marker = data[at + 1];
+        const bool isFrame =
+            marker >= 0xC0 && marker <= 0xCF && marker != 0xC4 && marker != 0xC8 && marker != 0xCC;
+        if (isFrame)
+            return Size{Number(&data[at + 7], 2), Number(&data[at + 5], 2)};
+        at += marker == 0xFF ? 1 : 2 + static_cast<size_t>(Number(&data[at + 2], 2));
+    }
+    return std::nullopt;
+}
+
+} // namespace
+
+bool SetTag(Tags& tags, const char* key, const char* value) {
+    if (key == nullptr || *key == '\0')
+        return false;
+    if (value == nullptr || *value == '\0')
+        tags.erase(key);
+    else
+        tags[key] = value;
+    return true;
+}
+
+Cover MakeCover(const void* data, int64_t size) {
+    Cover cover;
+    if (data == nullptr || size <= 0 || size > INT32_MAX)
+        return cover;
+    const auto* bytes = static_cast<const uint8_t*>(data);
+    cover.data = std::make_shared<std::vector<uint8_t>>(bytes, bytes + size);
+    const std::optional<Size> png = PngSize(*cover.data);
+    const std::optional<Size> found = png ? png : JpegSize(*cover.data);
+    if (found && found->width > 0 && found->height > 0) {
+        cover.codec = png ? AV_CODEC_ID_PNG : AV_CODEC_ID_MJPEG;
+        cover.width = found->width;
+        cover.height = found->height;
+    }
+    return cover;
+}
+
+std::vector<Chapter> ChaptersWithin(const std::vector<Chapter>& chapters, int64_t begin, int64_t length) {
+    std::vector<Chapter> within;
+    for (const Chapter& chapter : chapters) {
+        const int64_t from = std::max<int64_t>(0, chapter.begin - begin);
+        const int64_t to = std::min(length, chapter.end - begin);
+        if (from < to)
+            within.push_back({from, to, chapter.title});
+    }
+    std::stable_sort(within.begin(), within.end(),
+                     [](const Chapter& one, const Chapter& other) { return one.begin < other.begin; });
+    return within;
+}
+
+} // namespace writer
