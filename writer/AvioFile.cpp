@@ -43,7 +43,7 @@ int AvioFile::Write(const uint8_t* data, int size) {
             size_.store(std::max(size_.load(std::memory_order_relaxed), position_),
                         std::memory_order_relaxed);
         } else if (const int error = written < 0 ? static_cast<int>(-written) : EIO;
-                   (error != ENOSPC && error != EDQUOT) || !onFull_ || !onFull_()) {
+                   (error != ENOSPC && error != EDQUOT) || !onFull_ || !onFull_(size - done)) {
             error_ = error;
         }
     }

@@ -15,8 +15,8 @@ namespace writer {
 /// Works from the start of the file on. The first failure stays: nothing is written after it.
 class AvioFile {
 public:
-    /// Asked when the disk is full; true: try again.
-    using FullDiskHandler = std::function<bool()>;
+    /// Asked when the disk is full, with the bytes that it has not taken; true: try again.
+    using FullDiskHandler = std::function<bool(int64_t)>;
 
     enum class Mode { kRead, kWrite };
 

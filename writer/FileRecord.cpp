@@ -60,11 +60,14 @@ void FileRecord::Tell(int event) const {
     options_.pfnListener(options_.pContext, event, &status);
 }
 
-bool FileRecord::AskAboutFullDisk() const {
+bool FileRecord::AskAboutFullDisk(int64_t waiting) {
     if (options_.pfnFullDisk == nullptr)
         return false;
+    Update([waiting](WriterStatus& status) { status.llBytesWaiting = waiting; });
     const WriterStatus status = Snapshot();
-    return options_.pfnFullDisk(options_.pContext, &status) != 0;
+    const bool again = options_.pfnFullDisk(options_.pContext, &status) != 0;
+    Update([](WriterStatus& status) { status.llBytesWaiting = 0; });
+    return again;
 }
 
 void WriteLog(const char* format, ...) noexcept {

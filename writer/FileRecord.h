@@ -42,8 +42,8 @@ public:
     /// Calls the listener with a kWriterEvent.
     void Tell(int event) const;
 
-    /// Asks the host what to do about a full disk; true: try again.
-    bool AskAboutFullDisk() const;
+    /// Asks the host what to do about a full disk that has not taken so many bytes; true: try again.
+    bool AskAboutFullDisk(int64_t waiting);
 
 private:
     const int sequence_;

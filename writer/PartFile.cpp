@@ -19,8 +19,9 @@ PartFile::PartFile(const std::string& target, const FilePlan& plan, std::shared_
         throw SystemFailure(kWriterErrorOpen, error, "No file can be created in the folder \"%s\"",
                             text::FolderOf(target).c_str());
     try {
-        io_ = std::make_unique<AvioFile>(std::move(file), AvioFile::Mode::kWrite,
-                                         [this] { return record_->AskAboutFullDisk(); });
+        io_ = std::make_unique<AvioFile>(std::move(file), AvioFile::Mode::kWrite, [this](int64_t waiting) {
+            return record_->AskAboutFullDisk(waiting);
+        });
         muxer_ = std::make_unique<Muxer>(*plan.container, *io_, plan.Fragmented(), plan.bitExact,
                                          *record_->ExtraParts());
     } catch (...) {

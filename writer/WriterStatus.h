@@ -103,6 +103,7 @@ typedef struct WriterStatus {
     char szPath[kWriterPathSize];          ///< The target as the engine named it.
     char szTemporaryPath[kWriterPathSize]; ///< Where the data is until then; empty once complete or when
                                            ///< removed.
+    int64_t llBytesWaiting; ///< Of the write that a full disk has not taken yet; 0 when none waits.
 } WriterStatus;
 
 /// What a listener is told.

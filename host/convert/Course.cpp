@@ -6,8 +6,10 @@
 #include "text/Path.h"
 
 #include <algorithm>
+#include <cerrno>
 #include <chrono>
 #include <cmath>
+#include <cstring>
 #include <filesystem>
 #include <fmt/format.h>
 #include <limits>
@@ -18,6 +20,7 @@ namespace {
 constexpr std::chrono::milliseconds kTick{500};
 constexpr std::chrono::milliseconds kShortestInterval{100}; // between two reports of progress
 constexpr std::chrono::milliseconds kSuspicious{1500};      // between two ticks: the process was suspended
+constexpr double kLeastLength = 0.0011;                     // seconds: less means all the rest to the engine
 constexpr double kMostPercent = 99.9;                       // until the file has its name
 constexpr double kEarlyEnd = 1; // seconds by which a source may fall short of the length asked for
 
@@ -40,9 +43,10 @@ Course::Course(const Request& request, Movie& movie, Wishes& wishes, Observer& o
       wishes_(wishes),
       observer_(observer),
       length_(LengthToConvert(request, movie.Info())),
+      clips_(movie, request.begin, request.split),
       watch_(request, movie.Info(), wishes.bell),
       files_(observer),
-      engine_(MakeEngine(request, movie, watch_.OptionSet())),
+      engine_(MakeEngine(request, movie.Info(), clips_.Pictures(), clips_.Sound(), watch_.OptionSet())),
       clock_(Now()) {
     if (request.length)
         movie.EndPicturesAt(request.begin + length_);
@@ -54,8 +58,17 @@ Verdict Course::Run() {
     if (lengthKnown || request_.length)
         WarnOfSmallRoom();
     clock_.Skip(Now());
-    if (MCStart(engine_.get(), request_.begin, request_.length.value_or(0), EngineWindow(), OnProgress,
-                this) != 0)
+    RunEngine(request_.begin, request_.length.value_or(0));
+    while (GoesOn())
+        RunEngine(0, request_.length ? std::max(length_ - clips_.Offset(), kLeastLength) : 0);
+    return Conclude();
+}
+
+/// One file: all of an output that is not split.
+void Course::RunEngine(double begin, double length) {
+    position_ = 0;
+    outcome_ = kNone;
+    if (MCStart(engine_.get(), begin, length, nullptr, OnProgress, this) != 0)
         throw Failure(Category::kInternal, "the conversion could not be started");
     if (MCWait(engine_.get(), 0) == 0 && outcome_ == kNone)
         throw Failure(Category::kInternal, "no thread could be started for the conversion");
@@ -66,7 +79,29 @@ Verdict Course::Run() {
         throw;
     }
     MCWait(engine_.get(), MC_INFINITE);
-    return Conclude();
+}
+
+/// Whether another clip is to be made, after a pause if there is one just now.
+bool Course::GoesOn() {
+    TakeNews();
+    if (outcome_ != kOutcomeCompleted || files_.FirstFailure() || brokenOff_ || !clips_.Next())
+        return false;
+    AwaitResume();
+    FollowWishes();
+    if (userStopped_)
+        outcome_ = kOutcomeStopped;
+    return !userStopped_;
+}
+
+void Course::AwaitResume() {
+    while (wishes_.pause && !wishes_.stop) {
+        paused_ = true;
+        UpdateClock();
+        ReportProgress();
+        wishes_.bell.Wait(std::nullopt);
+    }
+    paused_ = false;
+    UpdateClock();
 }
 
 void Course::WarnOfSmallRoom() {
@@ -102,19 +137,28 @@ void Course::WaitForEnd() {
         FollowWishes();
         TakeNews();
         Show();
-        DiscardEngineEvents();
-        if (outcome_ == kNone && watch_.FileVanished())
-            Stop(); // whatever else were converted would be lost
+        LookAfterFile();
         if (outcome_ == kNone)
             ReportProgress();
     }
+}
+
+/// Ends the conversion when the open file has lost its place: whatever else were converted would be lost.
+void Course::LookAfterFile() {
+    const std::optional<std::string> vanished =
+        outcome_ == kNone && !brokenOff_ ? watch_.VanishedFile() : std::nullopt;
+    if (!vanished)
+        return;
+    brokenOff_.emplace(Category::kOutput, fmt::format("\"{}\" vanished while it was written: {}", *vanished,
+                                                      std::strerror(ENOENT)));
+    Stop();
 }
 
 void Course::UpdateClock() {
     const WorkClock::Time now = Now();
     if (now - clock_.Last() > kSuspicious)
         clock_.Skip(now);
-    if (paused_ || watch_.WaitsForRoom())
+    if (paused_ || watch_.WaitsForRoom() > 0)
         clock_.Stand(now);
     else
         clock_.Go(now);
@@ -161,6 +205,11 @@ void Course::SetPaused(bool pause) {
     paused_ = paused_ && pause;
 }
 
+/// Seconds converted, as the engine tells.
+double Course::Position() const {
+    return clips_.Offset() + position_;
+}
+
 /// Seconds converted when the movie is at `position`. A picture can reach beyond the length that was asked
 /// for, and a movie beyond the one it announces.
 double Course::Converted(double position) const {
@@ -170,7 +219,7 @@ double Course::Converted(double position) const {
 Progress Course::Figures() {
     Progress report;
     // While the rest of the sound is converted after the last picture, only the sound tells how far it is.
-    report.position = Converted(std::max(position_.load(), movie_.SoundSeconds()));
+    report.position = Converted(std::max(Position(), movie_.SoundSeconds()));
     report.length = length_;
     report.worked = clock_.Seconds();
     speed_.Add(report.worked, report.position);
@@ -186,10 +235,10 @@ Progress Course::Figures() {
 }
 
 Phase Course::CurrentPhase() const {
-    return watch_.WaitsForRoom() ? Phase::kWaitingForRoom
-           : paused_             ? Phase::kPaused
-           : files_.Finishing()  ? Phase::kFinishing
-                                 : Phase::kConverting;
+    return watch_.WaitsForRoom() > 0 ? Phase::kWaitingForRoom
+           : paused_                 ? Phase::kPaused
+           : files_.Finishing()      ? Phase::kFinishing
+                                     : Phase::kConverting;
 }
 
 void Course::ReportProgress() {
@@ -199,9 +248,9 @@ void Course::ReportProgress() {
     if (!changed && now - toldAt_ < kShortestInterval)
         return;
     if (changed && phase == Phase::kWaitingForRoom) {
-        observer_.Warned(
-            {Warning::Kind::kWaitsForRoom,
-             fmt::format("no space is left for \"{}\"; waiting until there is room", request_.output)});
+        observer_.Warned({Warning::Kind::kWaitsForRoom,
+                          fmt::format("no space is left for \"{}\"; waiting until there is room for {}",
+                                      request_.output, FormatBytes(watch_.WaitsForRoom()))});
     }
     toldPhase_ = phase;
     toldAt_ = now;
@@ -213,7 +262,6 @@ void Course::ReportProgress() {
 
 Verdict Course::Conclude() {
     TakeNews();
-    DiscardEngineEvents();
     if (const VideoImage* last = movie_.LastPicture(); last != nullptr && wishes_.pictures.Wants())
         wishes_.pictures.OfferLast(*last); // the engine shows but some
     Show();
@@ -223,7 +271,7 @@ Verdict Course::Conclude() {
     verdict.outcome = verdict.failure                               ? Outcome::kFailed
                       : userStopped_ && outcome_ == kOutcomeStopped ? Outcome::kStopped
                                                                     : Outcome::kDone;
-    verdict.position = Converted(position_);
+    verdict.position = Converted(Position());
     verdict.worked = clock_.Seconds();
     verdict.bytes = files_.Bytes();
     verdict.files = files_.Complete();
@@ -232,8 +280,12 @@ Verdict Course::Conclude() {
 
 /// What went wrong, by the writer's word, the engine's and the source's.
 std::optional<Failure> Course::FindFailure() {
+    if (brokenOff_)
+        return brokenOff_;
     if (files_.FirstFailure())
         return files_.FirstFailure();
+    if (const std::optional<std::string> missing = files_.FindMissing())
+        return Failure(Category::kOutput, *missing);
     std::string reason = movie_.ReadError();
     if (files_.Complete() == 0) { // the writer keeps no empty file
         if (userStopped_ && reason.empty())
@@ -247,21 +299,21 @@ std::optional<Failure> Course::FindFailure() {
     if (!reason.empty() && !userStopped_) {
         return Failure(Category::kSource,
                        fmt::format("reading \"{}\" failed after {}: {}; what was read is converted",
-                                   request_.input, FormatTime(request_.begin + position_, true), reason));
+                                   request_.input, FormatTime(request_.begin + Position(), true), reason));
     }
-    if (outcome_ == kOutcomeFailed) {
-        return Failure(Category::kInternal,
-                       fmt::format("the conversion broke off after {}, for want of memory",
-                                   FormatTime(request_.begin + position_, true)));
-    }
-    return std::nullopt;
+    if (outcome_ == kOutcomeCompleted || (userStopped_ && outcome_ == kOutcomeStopped))
+        return std::nullopt;
+    return Failure(Category::kInternal,
+                   fmt::format("the conversion broke off after {}{}",
+                               FormatTime(request_.begin + Position(), true),
+                               outcome_ == kOutcomeFailed ? ", for want of memory" : ""));
 }
 
 /// Why the source ended before what it promises, and before the length that was asked for; empty when it did
 /// not.
 std::string Course::WhyItEndedEarly() const {
     const std::optional<Shortfall> missing = movie_.Missing();
-    const double converted = std::max(position_.load(), movie_.SoundSeconds());
+    const double converted = std::max(Position(), movie_.SoundSeconds());
     const bool lengthReached = request_.length && length_ - converted <= kEarlyEnd;
     if (!missing || lengthReached || outcome_ != kOutcomeCompleted)
         return {};

@@ -4,6 +4,7 @@
 #define MOVIECONV_HOST_CONVERT_COURSE_H
 
 #include "host/convert/Bell.h"
+#include "host/convert/ClipCutter.h"
 #include "host/convert/Engine.h"
 #include "host/convert/FileLedger.h"
 #include "host/convert/Observer.h"
@@ -48,11 +49,15 @@ private:
 
     static unsigned OnProgress(void* context, unsigned kind, unsigned value, uintptr_t info);
 
+    void RunEngine(double begin, double length);
+    bool GoesOn();
+    void AwaitResume();
     void WarnOfSmallRoom();
     void WaitForEnd();
     void FollowWishes();
     void TakeNews();
     void Show();
+    void LookAfterFile();
     void Stop();
     void SetPaused(bool pause);
     void UpdateClock();
@@ -61,6 +66,7 @@ private:
     void ReportProgress();
     Verdict Conclude();
     std::optional<Failure> FindFailure();
+    double Position() const;
     double Converted(double position) const;
     std::string WhyItEndedEarly() const;
     void ReportComplaints();
@@ -70,18 +76,20 @@ private:
     Wishes& wishes_;
     Observer& observer_;
     const double length_;
+    ClipCutter clips_;
     WriterWatch watch_;
     FileLedger files_;
     Engine engine_;
 
     // The engine's worker sets these.
-    std::atomic<double> position_{0}; // in seconds
+    std::atomic<double> position_{0}; // in the clip, in seconds
     std::atomic<int> outcome_{kNone}; // once the worker has nothing more to say
 
     WorkClock clock_;
     SpeedMeter speed_;
     bool paused_ = false;
     bool userStopped_ = false;
+    std::optional<Failure> brokenOff_; // why the program itself ended the conversion
     Phase toldPhase_ = Phase::kConverting;
     WorkClock::Time toldAt_{};
 };

@@ -4,7 +4,7 @@
 
 #include "api/MovieConv.h"
 #include "host/convert/Request.h"
-#include "host/source/Movie.h"
+#include "host/source/Source.h"
 #include "writer/WriterStatus.h"
 
 #include <memory>
@@ -16,15 +16,11 @@ struct EngineDestroy {
 };
 using Engine = std::unique_ptr<void, EngineDestroy>;
 
-/// A converter for the movie with its parameters set as the request asks, for files with these options of the
-/// writer. Throws Failure.
-Engine MakeEngine(const Request& request, Movie& movie, uint32_t writerSet = kWriterDefaultSet);
-
-/// Marks this library's conversions in the engine's events: the window to be given to MCStart.
-OpaqueWindowPtr* EngineWindow();
-
-/// Takes those events out of the main queue: all that they tell comes by the callback, too.
-void DiscardEngineEvents();
+/// A converter for these decoders of the source, with its parameters set as the request asks, for files with
+/// these options of the writer; with a split it makes one clip at
+/// a time. It posts no events. Throws Failure.
+Engine MakeEngine(const Request& request, const SourceInfo& source, VideoDecoder* pictures,
+                  AudioDecoder* sound, uint32_t writerSet = kWriterDefaultSet);
 
 } // namespace movieconv
 

@@ -82,7 +82,7 @@ bool FileLedger::Enter(const WriterWatch::News& news) {
         break;
     case kWriterEventClosed:
         finishing_ = 1; // until the next clip or the end
-        EnterClosed(news.status);
+        EnterClosed(news);
         break;
     default:
         break;
@@ -92,10 +92,29 @@ bool FileLedger::Enter(const WriterWatch::News& news) {
     return !(wasWell && failure_);
 }
 
-void FileLedger::EnterClosed(const WriterStatus& file) {
+std::optional<std::string> FileLedger::FindMissing() const {
+    for (const Entry& entry : complete_) {
+        const FileIdentity now = IdentityOf(entry.path);
+        if (entry.identity.exists && now == entry.identity)
+            continue;
+        if (!now.exists)
+            return fmt::format("\"{}\" was written but stands there no more: it vanished meanwhile",
+                               entry.path);
+        return fmt::format("\"{}\" was written, but another file stands there now", entry.path);
+    }
+    return std::nullopt;
+}
+
+void FileLedger::EnterClosed(const WriterWatch::News& news) {
+    const WriterStatus& file = news.status;
     if (file.nState != kWriterFileComplete)
         return;
-    ++complete_;
+    complete_.push_back({file.szPath, news.identity});
+    if (news.identity.exists && news.identity.size != file.llBytesWritten && !failure_) {
+        failure_.emplace(Category::kOutput,
+                         fmt::format("\"{}\" has {} bytes, but {} were written into it", file.szPath,
+                                     news.identity.size, file.llBytesWritten));
+    }
     bytes_ += file.llBytesWritten;
     observer_.Closed({opened_, file.szPath, file.dVideoWritten, file.dAudioWritten, file.llBytesWritten});
     if (const std::string missing = MissingFrom(file); !missing.empty() && !failure_)

@@ -8,6 +8,7 @@
 
 #include <optional>
 #include <string>
+#include <vector>
 
 namespace movieconv {
 
@@ -19,21 +20,30 @@ public:
     bool Enter(const WriterWatch::News& news);
 
     int Opened() const { return opened_; }
-    int Complete() const { return complete_; }
+    int Complete() const { return static_cast<int>(complete_.size()); }
     int64_t Bytes() const { return bytes_; } ///< Of the complete files.
 
     /// How much of the last file's finishing is done, 0 to 1; nothing while it takes pictures and sound.
     std::optional<double> Finishing() const { return finishing_; }
 
+    /// Why not everything that was closed stands under its name, a sentence; nothing when it does.
+    std::optional<std::string> FindMissing() const;
+
     /// What went wrong first; nothing when all is well.
     const std::optional<Failure>& FirstFailure() const { return failure_; }
 
 private:
-    void EnterClosed(const WriterStatus& file);
+    /// A complete file, and what stood under its name when it was closed.
+    struct Entry {
+        std::string path;
+        FileIdentity identity;
+    };
+
+    void EnterClosed(const WriterWatch::News& news);
 
     Observer& observer_;
     int opened_ = 0;
-    int complete_ = 0;
+    std::vector<Entry> complete_;
     int64_t bytes_ = 0;
     std::optional<double> finishing_;
     std::optional<Failure> failure_;

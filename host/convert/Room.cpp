@@ -26,7 +26,7 @@ Room EstimateRoom(const Request& request) {
                       Reason::kUnknownLength);
     }
     const double length = LengthToConvert(request, movie.Info());
-    const Engine engine = MakeEngine(request, movie);
+    const Engine engine = MakeEngine(request, movie.Info(), movie.Pictures(), movie.Sound());
     EncodeParam param{};
     MCGetEncodeParam(engine.get(), &param);
     const std::string folder = text::FolderOf(request.output);

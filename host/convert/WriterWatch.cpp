@@ -3,10 +3,12 @@
 #include "host/convert/Room.h"
 #include "text/Path.h"
 
+#include <algorithm>
 #include <cerrno>
 #include <chrono>
 #include <memory>
 #include <new>
+#include <sys/stat.h>
 #include <unistd.h>
 #include <utility>
 
@@ -14,7 +16,6 @@ namespace movieconv {
 namespace {
 
 constexpr std::chrono::seconds kRetryInterval{1};
-constexpr int64_t kEnoughRoom = 4 << 20;
 
 /// How the set's latest file stands; false when there is none.
 bool LatestFile(uint32_t set, WriterStatus& status) {
@@ -22,6 +23,13 @@ bool LatestFile(uint32_t set, WriterStatus& status) {
 }
 
 } // namespace
+
+FileIdentity IdentityOf(const std::string& path) noexcept {
+    struct stat status {};
+    if (stat(path.c_str(), &status) != 0)
+        return {};
+    return {true, status.st_dev, status.st_ino, status.st_size};
+}
 
 WriterWatch::WriterWatch(const Request& request, const SourceInfo& source, Bell& bell) : bell_(bell) {
     WriterOptions writer{};
@@ -82,7 +90,7 @@ int64_t WriterWatch::Bytes() const {
     return closedBytes_ + (open ? status->llBytesWritten : 0);
 }
 
-bool WriterWatch::FileVanished() const {
+std::optional<std::string> WriterWatch::VanishedFile() const {
     const auto before = std::make_unique<WriterStatus>();
     const auto after = std::make_unique<WriterStatus>();
     const auto isWritten = [this](WriterStatus& status) {
@@ -90,8 +98,10 @@ bool WriterWatch::FileVanished() const {
                status.szTemporaryPath[0] != '\0';
     };
     // A close may give the file its name in between.
-    return isWritten(*before) && access(before->szTemporaryPath, F_OK) != 0 && errno == ENOENT &&
-           isWritten(*after) && before->nSequence == after->nSequence;
+    const bool vanished = isWritten(*before) && access(before->szTemporaryPath, F_OK) != 0 &&
+                          (errno == ENOENT || errno == ENOTDIR) && isWritten(*after) &&
+                          before->nSequence == after->nSequence;
+    return vanished ? std::optional<std::string>(before->szTemporaryPath) : std::nullopt;
 }
 
 void WriterWatch::OnEvent(void* context, int event, const WriterStatus* status) {
@@ -99,7 +109,8 @@ void WriterWatch::OnEvent(void* context, int event, const WriterStatus* status) 
     {
         const std::lock_guard lock(watch->mutex_);
         try {
-            watch->news_.push_back({event, *status});
+            const bool complete = event == kWriterEventClosed && status->nState == kWriterFileComplete;
+            watch->news_.push_back({event, *status, complete ? IdentityOf(status->szPath) : FileIdentity{}});
         } catch (const std::bad_alloc&) {
             watch->newsLost_ = true;
         }
@@ -117,10 +128,13 @@ int WriterWatch::OnFullDisk(void* context, const WriterStatus* status) {
     }
 }
 
-/// Nothing announces free space, so it is asked for every second.
+/// Nothing announces free space, so it is asked for every second. Where the disk does not tell, or has room
+/// that this user does not get, the write is tried all the same.
 int WriterWatch::WaitForRoom(const WriterStatus& status) {
     const std::string folder = text::FolderOf(status.szPath);
-    waiting_ = true;
+    asleep_ = true;
+    waitingAt_ = status.llBytesWritten;
+    waiting_ = std::max<int64_t>(status.llBytesWaiting, 1);
     bell_.Ring();
     bool givenUp = false;
     bool retry = false;
@@ -129,10 +143,24 @@ int WriterWatch::WaitForRoom(const WriterStatus& status) {
         changed_.wait_for(lock, kRetryInterval, [&] { return givenUp_ || retry_; });
         givenUp = givenUp_;
         retry = std::exchange(retry_, false);
-    } while (!givenUp && !retry && FreeBytes(folder) < kEnoughRoom);
-    waiting_ = false;
+        const int64_t free = FreeBytes(folder);
+        retry = retry || free < 0 || free >= waiting_;
+    } while (!givenUp && !retry);
+    asleep_ = false;
     bell_.Ring();
     return givenUp ? 0 : 1;
+}
+
+/// A write that is tried again has not succeeded yet.
+int64_t WriterWatch::WaitsForRoom() const {
+    const int64_t waiting = waiting_;
+    if (waiting == 0 || asleep_)
+        return waiting;
+    const auto status = std::make_unique<WriterStatus>();
+    const bool stuck = LatestFile(set_, *status) && status->nError == kWriterErrorNone &&
+                       (status->nState == kWriterFileWriting || status->nState == kWriterFileFinishing) &&
+                       status->llBytesWritten <= waitingAt_;
+    return stuck ? waiting : 0;
 }
 
 } // namespace movieconv

@@ -13,8 +13,21 @@
 #include <deque>
 #include <mutex>
 #include <optional>
+#include <string>
 
 namespace movieconv {
+
+/// What stands under a name.
+struct FileIdentity {
+    bool exists = false;
+    uint64_t device = 0;
+    uint64_t inode = 0;
+    int64_t size = 0;
+    bool operator==(const FileIdentity&) const = default;
+};
+
+/// Looks at the disk. Needs no memory.
+FileIdentity IdentityOf(const std::string& path) noexcept;
 
 /// Registers the writer's options for one conversion, for as long as it exists: longer than the converter.
 class WriterWatch {
@@ -22,6 +35,7 @@ public:
     struct News {
         int event; ///< kWriterEvent...
         WriterStatus status;
+        FileIdentity identity; ///< Of a complete file that is closed.
     };
 
     /// `bell` is rung whenever there is news.
@@ -33,14 +47,15 @@ public:
     /// The oldest news that was not taken yet. Throws std::bad_alloc once when there was no memory for some.
     std::optional<News> Take();
 
-    /// Whether the writer waits for room on a full disk.
-    bool WaitsForRoom() const { return waiting_; }
+    /// For how many bytes of room the writer waits on a full disk; 0 when it does not.
+    int64_t WaitsForRoom() const;
 
     /// The number of the set of options, for EncodeParam::nReserved[kWriterSetWord].
     uint32_t OptionSet() const { return set_; }
 
-    /// Whether the file that is being written has lost its place, by its own removal or the folder's.
-    bool FileVanished() const;
+    /// The temporary name of the file that is being written when nothing stands there any more, by its own
+    /// removal or the folder's.
+    std::optional<std::string> VanishedFile() const;
 
     /// Ends the waiting for room: the file fails.
     void GiveUp();
@@ -64,7 +79,9 @@ private:
     bool newsLost_ = false;
     bool givenUp_ = false;
     bool retry_ = false;
-    std::atomic<bool> waiting_{false};
+    std::atomic<int64_t> waiting_{0};   // bytes, until they are written
+    std::atomic<int64_t> waitingAt_{0}; // where in the file
+    std::atomic<bool> asleep_{false};   // until the write is tried again
     std::atomic<int64_t> closedBytes_{0};
 };
 

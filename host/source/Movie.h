@@ -29,6 +29,9 @@ public:
     /// The picture handed out last, null without one. Once the conversion has ended.
     const VideoImage* LastPicture() const { return pictures_ ? pictures_->Last() : nullptr; }
 
+    /// PictureDecoder::TimeOfNext; nothing without pictures.
+    std::optional<int64_t> TimeOfNextPicture() { return pictures_ ? pictures_->TimeOfNext() : std::nullopt; }
+
     /// Leaves out the pictures from that time on, where the engine would write one more. Only before the
     /// conversion.
     void EndPicturesAt(double seconds);

@@ -75,12 +75,20 @@ int PictureDecoder::DecodeNext(int /*mode*/) {
     return ended_ ? 0 : 1;
 }
 
+std::optional<int64_t> PictureDecoder::TimeOfNext() {
+    if (!next_ && GetCurrentImage() != nullptr)
+        next_ = queue_.Pop();
+    return next_ ? std::optional(next_->stamp.time) : std::nullopt;
+}
+
 /// Makes the next picture the current one; the last one stays when there is none.
 bool PictureDecoder::Advance() {
-    std::optional<Picture> next = queue_.Pop();
-    if (!next)
+    if (!next_)
+        next_ = queue_.Pop();
+    if (!next_)
         return false;
-    current_ = std::move(*next);
+    current_ = std::move(*next_);
+    next_.reset();
     const AVFrame& frame = *current_.frame;
     image_ = {};
     image_.nType = kMediaTypePicture;

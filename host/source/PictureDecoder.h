@@ -35,6 +35,10 @@ public:
     VideoImage* GetCurrentImage() override;
     int DecodeNext(int mode) override;
 
+    /// When the picture after the current one begins, in media time; nothing when there is none. Waits for
+    /// it. Where GetCurrentImage may be called.
+    std::optional<int64_t> TimeOfNext();
+
     /// Leaves out the pictures from that time on. Only before the first is taken.
     void EndAt(double seconds);
 
@@ -95,6 +99,7 @@ private:
 
     // The engine worker's.
     Picture current_;
+    std::optional<Picture> next_; // taken from the queue already
     VideoImage image_{};
     bool ended_ = false;
 };

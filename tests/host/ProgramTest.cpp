@@ -2,6 +2,7 @@
 #include "tests/host/Program.h"
 #include "tests/host/Inspect.h"
 #include "tests/host/TestMovies.h"
+#include "tests/support/SmallDisk.h"
 
 #include <gtest/gtest.h>
 
@@ -11,7 +12,6 @@
 #include <fcntl.h>
 #include <filesystem>
 #include <ostream>
-#include <sys/mount.h>
 #include <sys/stat.h>
 #include <thread>
 #include <unistd.h>
@@ -523,30 +523,9 @@ TEST(Program, WritesTheSameFileWhateverThePauses) {
     EXPECT_EQ(ReadFile(folder / "steady.mp4"), ReadFile(folder / "paused.mp4"));
 }
 
-/// A small disk; usable only where the test may mount one.
-class SmallDisk {
-public:
-    explicit SmallDisk(const std::string& path) : path_(path) {
-        fs::create_directory(path);
-        mounted_ = mount("tmpfs", path.c_str(), "tmpfs", 0, "size=600k") == 0;
-    }
-    ~SmallDisk() {
-        if (mounted_)
-            umount2(path_.c_str(), MNT_DETACH);
-    }
-    SmallDisk(const SmallDisk&) = delete;
-    SmallDisk& operator=(const SmallDisk&) = delete;
-    bool IsThere() const { return mounted_; }
-    bool Grow() const { return mount(nullptr, path_.c_str(), nullptr, MS_REMOUNT, "size=60M") == 0; }
-
-private:
-    const std::string path_;
-    bool mounted_ = false;
-};
-
 TEST(Program, KeepsWhatIsDoneOnAFullDiskRemovesItOrWaits) {
     const Folder folder;
-    const SmallDisk disk(folder / "disk");
+    const SmallDisk disk(folder / "disk", "600k");
     if (!disk.IsThere())
         GTEST_SKIP() << "no small disk can be mounted here";
     const Args making{Minute(), folder / "disk/out.mov", "--audio-codec", "PCM"};
@@ -575,7 +554,7 @@ TEST(Program, KeepsWhatIsDoneOnAFullDiskRemovesItOrWaits) {
 
 TEST(Program, ConvertsAllAlthoughTheLogCannotBeWritten) {
     const Folder folder;
-    const SmallDisk disk(folder / "disk");
+    const SmallDisk disk(folder / "disk", "600k");
     if (!disk.IsThere())
         GTEST_SKIP() << "no small disk can be mounted here";
     WriteFile(folder / "disk/much", std::string(1'000'000, 'x'));
