@@ -2,6 +2,8 @@
 #ifndef MOVIECONV_HOST_CONVERT_REQUEST_H
 #define MOVIECONV_HOST_CONVERT_REQUEST_H
 
+#include "host/source/Deinterlace.h"
+
 #include <chrono>
 #include <cstdint>
 #include <optional>
@@ -38,6 +40,7 @@ struct Request {
     std::optional<int32_t> audioMaxRate;
     std::optional<int32_t> channels;
     std::optional<int32_t> sampleRate; ///< Samples per second and channel.
+    Deinterlace deinterlace = Deinterlace::kFlagged;
     bool noVideo = false;
     bool noAudio = false;
     bool playlists = false; ///< The input may be a playlist, which names movies in its folder and below.

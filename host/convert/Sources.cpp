@@ -6,7 +6,10 @@ namespace movieconv {
 namespace {
 
 SourceChoice ChoiceOf(const Request& request) {
-    return {.pictures = !request.noVideo, .sound = !request.noAudio, .playlists = request.playlists};
+    return {.pictures = !request.noVideo,
+            .sound = !request.noAudio,
+            .deinterlace = request.deinterlace,
+            .playlists = request.playlists};
 }
 
 /// What `open` gives, with its errors as failures.

@@ -36,9 +36,11 @@ WriterWatch::WriterWatch(const Request& request, const SourceInfo& source, Bell&
     if (source.pictures) {
         writer.nSampleAspectNum = source.pictures->pixelAspect.num;
         writer.nSampleAspectDen = source.pictures->pixelAspect.den;
-        writer.nColorPrimaries = source.pictures->colorPrimaries;
-        writer.nColorTransfer = source.pictures->colorTransfer;
-        writer.nColorMatrix = source.pictures->colorMatrix;
+        constexpr int kBt709 = 1;
+        const PictureStreamInfo& pictures = *source.pictures;
+        writer.nColorPrimaries = IsHdr(pictures) ? kBt709 : pictures.colorPrimaries;
+        writer.nColorTransfer = IsHdr(pictures) ? kBt709 : pictures.colorTransfer;
+        writer.nColorMatrix = IsHdr(pictures) ? kBt709 : pictures.colorMatrix;
     }
     writer.bKeepExisting = request.overwrite ? 0 : 1;
     writer.bRemovePartial = request.keepPartial ? 0 : 1;

@@ -9,7 +9,7 @@ namespace movieconv {
 Movie::Movie(const std::string& path, const SourceChoice& choice)
     : source_(path, choice), failures_([this] { demuxer_.Stop(); }), demuxer_(source_, failures_) {
     if (source_.PictureStream() != nullptr)
-        pictures_ = std::make_unique<PictureDecoder>(source_, demuxer_, failures_);
+        pictures_ = std::make_unique<PictureDecoder>(source_, demuxer_, failures_, choice.deinterlace);
     if (source_.SoundStream() != nullptr)
         sound_ = std::make_unique<SoundDecoder>(source_, demuxer_, failures_);
 }
@@ -41,6 +41,10 @@ std::vector<std::string> Movie::Complaints() const {
     std::vector<std::string> texts;
     if (!source_.LeftOut().empty())
         texts.push_back(source_.LeftOut());
+    if (pictures_ && pictures_->Deinterlaced())
+        texts.emplace_back("interlaced pictures were made progressive");
+    if (pictures_ && IsHdr(*Info().pictures))
+        texts.emplace_back("its HDR pictures were brought to the light and colours of BT.709");
     if (const int jumps = demuxer_.ClockJumps(); jumps > 0) {
         texts.push_back(fmt::format("the source's clock jumped {}; the parts were joined",
                                     jumps == 1 ? "once" : fmt::format("{} times", jumps)));

@@ -25,7 +25,8 @@ double BitsPerPixel(const Source& source) {
 
 } // namespace
 
-PictureDecoder::PictureDecoder(const Source& source, Demuxer& demuxer, Failures& failures)
+PictureDecoder::PictureDecoder(const Source& source, Demuxer& demuxer, Failures& failures,
+                               Deinterlace deinterlace)
     : reader_(source.Reader()),
       demuxer_(demuxer),
       failures_(failures),
@@ -34,6 +35,7 @@ PictureDecoder::PictureDecoder(const Source& source, Demuxer& demuxer, Failures&
       parameters_(CopyOf(*source.PictureStream()->codecpar)),
       threads_(BitsPerPixel(source)),
       decoder_(std::make_unique<StreamDecoder>(*parameters_, timeBase_, threads_.Count())),
+      filter_(*source.Info().pictures, deinterlace),
       converter_(source.Info().pictures->quarterTurns, source.Info().pictures->mirrored),
       stamps_(ToMediaTime(1 / source.Info().pictures->frameRate)),
       queue_(threads_.OnTrial() ? kPicturesAhead : kHeavyPicturesAhead, kBytesAhead,
@@ -114,6 +116,7 @@ void PictureDecoder::Run() {
     });
     ranDry_ = !refused_;
     repaired_ = stamps_.Repaired();
+    deinterlaced_ = filter_.Deinterlaced();
     damaged_ = damagedBefore_ + decoder_->Damaged();
     queue_.Finish();
 }
@@ -131,6 +134,9 @@ void PictureDecoder::DecodeAll() {
             return;
     }
     decoder_->Decode(nullptr, accept);
+    if (!refused_)
+        filter_.Finish(
+            [this](AVFrame& picture, std::optional<int64_t> stamp) { return Hold(picture, stamp); });
 }
 
 bool PictureDecoder::Accept(AVFrame& frame) {
@@ -142,13 +148,19 @@ bool PictureDecoder::Accept(AVFrame& frame) {
     std::optional<int64_t> stamp;
     if (frame.best_effort_timestamp != AV_NOPTS_VALUE)
         stamp = reader_.MediaTime(frame.best_effort_timestamp, timeBase_);
+    return filter_.Push(
+        frame, stamp, [this](AVFrame& picture, std::optional<int64_t> time) { return Hold(picture, time); });
+}
+
+/// Keeps the picture until its stamp is settled, and hands on the one before it.
+bool PictureDecoder::Hold(AVFrame& picture, std::optional<int64_t> stamp) {
     const auto previous = stamps_.Push(stamp);
     if (previous && !Deliver(*previous)) {
         held_.reset();
         return false;
     }
     held_ = av::NewFrame();
-    av_frame_move_ref(held_.get(), &frame);
+    av_frame_move_ref(held_.get(), &picture);
     return true;
 }
 

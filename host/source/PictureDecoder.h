@@ -10,6 +10,7 @@
 #include "host/source/Demuxer.h"
 #include "host/source/Failures.h"
 #include "host/source/PictureConverter.h"
+#include "host/source/PictureFilter.h"
 #include "host/source/StampRepair.h"
 #include "host/source/StreamDecoder.h"
 #include "media/Decoders.h"
@@ -27,7 +28,7 @@ class PictureDecoder final : public VideoDecoder {
 public:
     /// The first picture handed out is the one shown at the time that Seek asked for, stamped with that time;
     /// without Seek it is the movie's first, stamped with 0 if it comes later. Throws SourceError.
-    PictureDecoder(const Source& source, Demuxer& demuxer, Failures& failures);
+    PictureDecoder(const Source& source, Demuxer& demuxer, Failures& failures, Deinterlace deinterlace);
     ~PictureDecoder();
 
     VideoSourceInfo* GetVideoInfo() override { return &info_; }
@@ -48,6 +49,7 @@ public:
     /// Figures for the closing report. Any thread.
     int64_t Damaged() const { return damaged_; }
     int64_t Repaired() const { return repaired_; }
+    bool Deinterlaced() const { return deinterlaced_; }
 
     /// Whether the source's last picture has been decoded and handed on. Any thread.
     bool RanDry() const { return ranDry_; }
@@ -64,6 +66,7 @@ private:
     void Run();
     void DecodeAll();
     bool Accept(AVFrame& frame);
+    bool Hold(AVFrame& picture, std::optional<int64_t> stamp);
     bool Deliver(StampRepair::Stamp stamp);
     bool UseMoreThreads(const std::vector<av::Packet>& known);
     bool Advance();
@@ -79,6 +82,7 @@ private:
     const av::CodecParameters parameters_;
     DecodingThreads threads_;
     std::unique_ptr<StreamDecoder> decoder_;
+    PictureFilter filter_;
     PictureConverter converter_;
     StampRepair stamps_;
     av::Frame held_; // decoded, its stamp not settled yet
@@ -95,6 +99,7 @@ private:
     std::atomic<int64_t> damaged_{0};
     std::atomic<int64_t> repaired_{0};
     std::atomic<bool> ranDry_{false};
+    std::atomic<bool> deinterlaced_{false};
     std::thread thread_;
 
     // The engine worker's.

@@ -3,6 +3,7 @@
 #define MOVIECONV_HOST_SOURCE_SOURCEINFO_H
 
 #include "host/source/Completeness.h"
+#include "host/source/Deinterlace.h"
 
 #include <cstdint>
 #include <optional>
@@ -64,6 +65,14 @@ struct PictureStreamInfo {
     std::optional<LightLevel> lightLevel;
     bool dolbyVision = false;
 };
+
+/// Whether the pictures are made for more light and colour than usual displays have. They are handed out as
+/// BT.709.
+inline bool IsHdr(const PictureStreamInfo& pictures) {
+    constexpr int kPerceptualQuantizer = 16;
+    constexpr int kHybridLogGamma = 18;
+    return pictures.colorTransfer == kPerceptualQuantizer || pictures.colorTransfer == kHybridLogGamma;
+}
 
 struct SoundStreamInfo {
     int index = -1;
@@ -132,8 +141,9 @@ struct SourceInfo {
 };
 
 struct SourceChoice {
-    bool pictures = true;   ///< Look for pictures at all.
-    bool sound = true;      ///< Look for sound at all.
+    bool pictures = true; ///< Look for pictures at all.
+    bool sound = true;    ///< Look for sound at all.
+    Deinterlace deinterlace = Deinterlace::kFlagged;
     bool playlists = false; ///< Also open what names other movies, in its own folder and below.
 };
 

@@ -81,6 +81,11 @@ void AddPictures(CLI::App& app, Options& options) {
                    {{"borders", Fit::kBorders}, {"stretch", Fit::kStretch}},
                    "How pictures of another shape fill it: with borders\n(default) or by stretching")
         ->group(group);
+    AddChoice<Deinterlace>(
+        app, "--deinterlace", options.request.deinterlace,
+        {{"all", Deinterlace::kAll}, {"auto", Deinterlace::kFlagged}, {"off", Deinterlace::kNone}},
+        "Make pictures progressive that say they are interlaced\n(auto, the default), all or none")
+        ->group(group);
     AddParsed(app, "--frame-rate", ParseFrameRate, options.request.frameRate,
               "a frame rate up to 200, such as 25 or 30000/1001",
               "Pictures per second; by default the source's")
