@@ -2,6 +2,7 @@
 
 #include "engine/Arithmetic.h"
 #include "engine/PostMessage.h"
+#include "engine/WriterCalls.h"
 #include "log/dyLog.h"
 #include "media/MediaWriter.h"
 #include "text/Utf8.h"
@@ -17,6 +18,51 @@ namespace {
 
 constexpr int32_t kProgressComplete = 10000; // hundredths of a percent
 
+/// What the writer's errors are called in results.
+int CategoryOf(int writerError) {
+    switch (writerError) {
+    case kWriterErrorArgument:
+        return MC_RESULT_PARAMETERS;
+    case kWriterErrorFormat:
+    case kWriterErrorCodec:
+        return MC_RESULT_FORMAT;
+    case kWriterErrorExists:
+        return MC_RESULT_EXISTS;
+    case kWriterErrorOpen:
+        return MC_RESULT_CANNOT_OPEN;
+    case kWriterErrorNoSpace:
+        return MC_RESULT_NO_SPACE;
+    case kWriterErrorEncode:
+        return MC_RESULT_ENCODE;
+    case kWriterErrorInternal:
+        return MC_RESULT_INTERNAL;
+    case kWriterErrorRefused:
+        return MC_RESULT_REFUSED;
+    default:
+        return MC_RESULT_WRITE;
+    }
+}
+
+/// How the worker's current file stands; all zero when the writer does not tell.
+WriterStatus FileStatus() {
+    WriterStatus status{};
+    status.nSize = sizeof status;
+    if (!Writer().getThreadFileStatus || Writer().getThreadFileStatus(&status) == 0)
+        status = {};
+    return status;
+}
+
+/// What is wrong with a picture that was not taken, as far as it shows.
+const char* FaultOf(const VideoImage& picture) {
+    if (picture.nFormat != kPictureFormatPlanar420)
+        return "A picture was not taken: its format is not planar 4:2:0 (nFormat 2).";
+    if (!picture.pY || !picture.pU || !picture.pV)
+        return "A picture was not taken: one of its planes is null.";
+    if (picture.nWidth <= 0 || picture.nHeight <= 0)
+        return "A picture was not taken: its size makes no sense.";
+    return "A picture was not taken by the media writer.";
+}
+
 /// An estimate that there is no basis for yet is infinite or not a number; the host gets 0 instead.
 double FiniteOrZero(double value) {
     return std::isfinite(value) ? value : 0.0;
@@ -27,36 +73,43 @@ double FiniteOrZero(double value) {
 bool ConvThread::Conversion::CreateFile(const wchar_t* fileName) {
     filePath = text::ToUtf8(fileName);
     bFileEmpty = true;
+    nPicturesTaken = nSamplesTaken = 0;
     hFile = MWCreateMediaFile(fileName, &converter.encodeParam, pVideoFormat, pAudioFormat);
     if (hFile) {
         converter.results.Update([](MCResult& result) { ++result.nFilesCreated; });
         return true;
     }
-    converter.results.Fail(MC_RESULT_CANNOT_OPEN, "The media writer could not create the file.",
-                           filePath.c_str());
-    StopAfterFailure();
+    NoteFailure(MC_RESULT_CANNOT_OPEN, "The media writer could not create the file.");
     return false;
 }
 
 void ConvThread::Conversion::CloseFile(ProgressCallback callback, void* context) {
     const bool complete = MWCloseMediaFile(hFile, callback, context) != 0;
-    if (complete)
-        converter.results.Update([](MCResult& result) { ++result.nFilesComplete; });
-    else if (hFile && !bFileEmpty)
-        converter.results.Fail(MC_RESULT_WRITE, "The media writer could not complete the file.",
-                               filePath.c_str());
+    if (!hFile)
+        return;
+    const WriterStatus status = FileStatus();
+    const bool told = status.nState != 0;
+    converter.results.Update([&](MCResult& result) {
+        result.nFilesComplete += complete ? 1 : 0;
+        result.llPicturesWritten += told ? status.llPicturesWritten : nPicturesTaken;
+        result.llSamplesWritten += told ? status.llSamplesWritten : nSamplesTaken;
+    });
+    const bool empty = told ? status.nState == kWriterFileEmpty : bFileEmpty;
+    if (!complete && !empty)
+        NoteFailure(MC_RESULT_WRITE, "The media writer could not complete the file.");
     hFile = nullptr;
 }
 
 void ConvThread::Conversion::Send(const VideoImage& picture) {
     const bool taken = MWWriteVideoFrame(hFile, &picture) != 0;
     bFileEmpty = false;
+    nPicturesTaken += taken ? 1 : 0;
     converter.results.Update([taken](MCResult& result) {
         ++result.llPicturesSent;
-        ++(taken ? result.llPicturesWritten : result.llPicturesRefused);
+        result.llPicturesRefused += taken ? 0 : 1;
     });
     if (!taken)
-        NoteRefusal("The media writer did not take a picture.");
+        NoteFailure(MC_RESULT_REFUSED, FaultOf(picture));
 }
 
 void ConvThread::Conversion::Send(const AudioFrame& block) {
@@ -66,20 +119,25 @@ void ConvThread::Conversion::Send(const AudioFrame& block) {
     bFileEmpty = false;
     const int32_t frame = WrapMul(block.nChannels, block.nBitsPerSample) / 8;
     const int32_t samples = frame > 0 ? block.nLength / frame : 0;
+    nSamplesTaken += taken ? samples : 0;
     converter.results.Update([=](MCResult& result) {
         result.llSamplesSent += samples;
-        (taken ? result.llSamplesWritten : result.llSamplesRefused) += samples;
+        result.llSamplesRefused += taken ? 0 : samples;
     });
     if (!taken)
-        NoteRefusal("The media writer did not take a block of sound.");
+        NoteFailure(MC_RESULT_REFUSED,
+                    "A block of sound was not taken by the media writer: its format makes no sense, "
+                    "or it has no data.");
 }
 
-void ConvThread::Conversion::NoteRefusal(const char* what) {
-    converter.results.Fail(MC_RESULT_REFUSED, what, filePath.c_str());
-    StopAfterFailure();
-}
-
-void ConvThread::Conversion::StopAfterFailure() {
+// The writer's own word where it has one.
+void ConvThread::Conversion::NoteFailure(int category, const char* what) {
+    const WriterStatus status = FileStatus();
+    if (status.nError != kWriterErrorNone)
+        converter.results.Fail(CategoryOf(status.nError), status.szWhat, filePath.c_str(),
+                               status.nSystemError);
+    else
+        converter.results.Fail(category, what, filePath.c_str());
     if (converter.bStopOnFailure)
         converter.Abort(0, 0);
 }

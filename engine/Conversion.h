@@ -79,6 +79,8 @@ protected:
     void* hFile = nullptr;                     // null between clips
     std::string filePath;                      // the current file's, UTF-8
     bool bFileEmpty = true;                    // nothing was sent into the current file
+    int64_t nPicturesTaken = 0;                // of the current file
+    int64_t nSamplesTaken = 0;                 // likewise
     double dPosition = 0.0;                    // seconds of the source converted
     double dClipStart = 0.0;                   // position at which the current clip began
     double dSpeed = 0.0;                       // estimate: source seconds per second
@@ -89,8 +91,7 @@ protected:
 private:
     void CloseFile(ProgressCallback callback, void* context);
     void NoteException();
-    void NoteRefusal(const char* what);
-    void StopAfterFailure();
+    void NoteFailure(int category, const char* what);
     unsigned CallBack(unsigned kind, unsigned value, const ProgressInfo* info);
     ProgressInfo MakeProgressInfo(int32_t nProgress, uint32_t elapsed) const;
     int Post(unsigned wParam, unsigned lParam) const;

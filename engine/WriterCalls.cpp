@@ -23,6 +23,7 @@ WriterCalls LookUpAll() {
     WriterCalls calls;
     LookUp(writer, "MWGetVersion", calls.getVersion);
     LookUp(writer, "MWForwardLog", calls.forwardLog);
+    LookUp(writer, "MWGetThreadFileStatus", calls.getThreadFileStatus);
     return calls;
 }
 

@@ -9,6 +9,7 @@
 struct WriterCalls {
     decltype(&MWGetVersion) getVersion = nullptr;
     decltype(&MWForwardLog) forwardLog = nullptr;
+    decltype(&MWGetThreadFileStatus) getThreadFileStatus = nullptr;
 };
 
 /// Those of the writer that the process runs with.

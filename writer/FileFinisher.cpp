@@ -1,5 +1,6 @@
 #include "writer/FileFinisher.h"
 
+#include "platform/LogRoute.h"
 #include "writer/AvioFile.h"
 #include "writer/Fragments.h"
 #include "writer/WriterFailure.h"
@@ -66,7 +67,8 @@ void FileFinisher::FinishFragments() {
             const WriterFailure failure = FailureOf(std::current_exception());
             if (failure.Kind() == kWriterErrorFinish)
                 throw;
-            WriteLog("Keeping the fragmented form of \"%s\": %s", target_.c_str(), failure.what());
+            WriteLog(kLogWarning, "Keeping the fragmented form of \"%s\": %s", target_.c_str(),
+                     failure.what());
         }
     }
     Publish(part_.Path(), *part_.File());
@@ -94,7 +96,8 @@ void FileFinisher::Publish(const std::string& path, ByteFile& file) {
         throw SystemFailure(kWriterErrorFinish, error, "Renaming \"%s\" failed", path.c_str());
     record_.SetTemporaryPath("");
     if (const int error = files_.SyncFolder(target_); error != 0)
-        WriteLog("Syncing the folder of \"%s\" failed: %s.", target_.c_str(), std::strerror(error));
+        WriteLog(kLogWarning, "Syncing the folder of \"%s\" failed: %s.", target_.c_str(),
+                 std::strerror(error));
 }
 
 void FileFinisher::Abandon() {
@@ -107,7 +110,7 @@ void FileFinisher::Abandon() {
         try {
             part_.WriteTrailer();
         } catch (...) {
-            WriteLog("The end of \"%s\" is missing: %s", part_.Path().c_str(),
+            WriteLog(kLogWarning, "The end of \"%s\" is missing: %s", part_.Path().c_str(),
                      FailureOf(std::current_exception()).what());
         }
     }

@@ -39,7 +39,7 @@ bool FileRecord::Fail(const WriterFailure& failure) noexcept {
         status_.nSystemError = failure.SystemError();
         CopyText(status_.szWhat, sizeof status_.szWhat, failure.what());
     }
-    WriteLog("Failed: %s: %s", status_.szPath, failure.what());
+    WriteLog(kLogError, "Failed: %s: %s", status_.szPath, failure.what());
     return true;
 }
 
@@ -70,14 +70,14 @@ bool FileRecord::AskAboutFullDisk(int64_t waiting) {
     return again;
 }
 
-void WriteLog(const char* format, ...) noexcept {
+void WriteLog(int level, const char* format, ...) noexcept {
     std::array<char, kWriterPathSize + kWriterTextSize> text;
     va_list arguments;
     va_start(arguments, format);
     std::vsnprintf(text.data(), text.size(), format, arguments);
     va_end(arguments);
     try {
-        LogEx(L"MediaWriter::%ls\r\n", text::FromUtf8(text.data()).c_str());
+        LogAt(level, L"MediaWriter::%ls\r\n", text::FromUtf8(text.data()).c_str());
     } catch (const std::exception&) { // no memory for the line
     }
 }

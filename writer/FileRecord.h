@@ -53,8 +53,9 @@ private:
     WriterStatus status_{};
 };
 
-/// One line to the log sink, of UTF-8 texts, as printf writes it. Lost when there is no memory.
-[[gnu::format(printf, 1, 2)]] void WriteLog(const char* format, ...) noexcept;
+/// One line to the log, of UTF-8 texts, as printf writes it, at a level of platform/LogRoute.h. Lost when
+/// there is no memory.
+[[gnu::format(printf, 2, 3)]] void WriteLog(int level, const char* format, ...) noexcept;
 
 } // namespace writer
 

@@ -66,6 +66,7 @@ MediaFile::MediaFile(const std::string& target, const EncodeParam& param, const 
                      const AudioFormat* audio, std::shared_ptr<FileRecord> record, FileSystem& files)
     : plan_(MakeFilePlan(param, video, audio, record->Options())),
       target_(UsableTarget(target, record->Options())),
+      claim_(target_),
       record_(std::move(record)),
       files_(files),
       part_(target_, plan_, record_, files),
@@ -128,8 +129,12 @@ void MediaFile::StartPictures() {
 }
 
 bool MediaFile::WriteVideo(const VideoImage& image) {
-    if (!pictures_ || !Usable(image) || record_->Failed())
+    if (!pictures_ || record_->Failed())
         return false;
+    if (!Usable(image)) {
+        refusedPictures_ = true;
+        return false;
+    }
     const int64_t time = stamps_.AddPicture(image.llTime);
     if (!firstPicture_) {
         firstPicture_ = time;
@@ -152,8 +157,12 @@ bool MediaFile::WriteVideo(const VideoImage& image) {
 
 bool MediaFile::WriteAudio(const AudioFrame& frame) {
     const PcmFormat format = FormatOf(frame);
-    if (!sound_ || !format.Valid() || frame.pData == nullptr || frame.nLength <= 0 || record_->Failed())
+    if (!sound_ || frame.nLength <= 0 || record_->Failed())
         return false;
+    if (!format.Valid() || frame.pData == nullptr) {
+        refusedSound_ = true;
+        return false;
+    }
     try {
         return AddSound(frame, format);
     } catch (...) {
@@ -239,6 +248,7 @@ int MediaFile::Conclude() {
     if (!record_->Failed()) {
         try {
             finisher.SetExtras(FinalExtras());
+            CheckRefusals();
             finisher.Finish();
             return kWriterFileComplete;
         } catch (...) {
@@ -260,6 +270,19 @@ Extras MediaFile::FinalExtras() const {
                  status.dAudioReceived);
     extras.chapters = ChaptersWithin(extras.chapters, shift, std::llround(end * kTicksPerSecond));
     return extras;
+}
+
+/// A stream of which nothing was fit to be taken fails the file: it would look complete without it.
+void MediaFile::CheckRefusals() {
+    const WriterStatus status = record_->Snapshot();
+    if (refusedPictures_ && status.llPicturesReceived == 0)
+        throw WriterFailure(kWriterErrorRefused,
+                            "No picture could be taken: each had another format than planar "
+                            "4:2:0, a missing plane, or a size or pitch that makes no sense.");
+    if (refusedSound_ && status.llSamplesReceived == 0)
+        throw WriterFailure(kWriterErrorRefused,
+                            "No sound could be taken: each block had a format that makes no "
+                            "sense, or no data.");
 }
 
 bool MediaFile::Empty() const {

@@ -22,6 +22,7 @@
 #include "writer/PictureStage.h"
 #include "writer/SoundStage.h"
 #include "writer/StampNormaliser.h"
+#include "writer/TargetClaim.h"
 
 #include <cstdint>
 #include <exception>
@@ -50,6 +51,8 @@ public:
     /// and leaves nothing behind. Nothing may be called afterwards.
     bool Close();
 
+    const std::shared_ptr<FileRecord>& Record() const { return record_; }
+
 private:
     void OpenStages();
     void StartPictures();
@@ -62,9 +65,11 @@ private:
     int Conclude();
     bool Empty() const;
     Extras FinalExtras() const;
+    void CheckRefusals();
 
     const FilePlan plan_;
     const std::string target_;
+    const TargetClaim claim_;
     const std::shared_ptr<FileRecord> record_;
     FileSystem& files_;
     PartFile part_;
@@ -74,6 +79,8 @@ private:
     std::vector<SoundBlock>
         waiting_; ///< Sound whose place is not known yet, or too short a stretch to hand on.
     bool soundStarted_ = false;
+    bool refusedPictures_ = false; ///< Some made no sense.
+    bool refusedSound_ = false;
     std::optional<int64_t> firstPicture_; ///< Its time in the file.
     std::optional<int64_t>
         sourceBegin_; ///< Where the first picture, or the sound alone, stood in the source.

@@ -31,6 +31,9 @@ Result Guarded(Result otherwise, Call call) noexcept {
     }
 }
 
+/// The file that this thread created or closed last.
+thread_local std::shared_ptr<const FileRecord> t_record;
+
 void Refuse(FileRecord& record, const WriterFailure& failure) {
     record.Fail(failure);
     record.Update([](WriterStatus& status) { status.nState = kWriterFileFailed; });
@@ -46,7 +49,9 @@ MediaFile* Create(const wchar_t* fileName, const EncodeParam* param, const Video
     std::shared_ptr<FileRecord> record;
     try {
         const std::string target = fileName == nullptr ? std::string() : text::ToUtf8(fileName);
+        t_record.reset();
         record = set->Open(target);
+        t_record = record;
         if (target.empty() || param == nullptr)
             throw WriterFailure(kWriterErrorArgument, "There is no file name, or there are no parameters.");
         if (!known)
@@ -111,6 +116,8 @@ int MWWriteAudioData(void* file, const AudioFrame* frame) {
 
 int MWCloseMediaFile(void* file, ProgressCallback /*callback*/, void* /*context*/) {
     const std::unique_ptr<MediaFile> owned(static_cast<MediaFile*>(file));
+    if (owned)
+        t_record = owned->Record();
     return Guarded(0, [&] { return owned && owned->Close() ? 1 : 0; });
 }
 
@@ -199,6 +206,10 @@ int MWGetFileStatus(uint32_t set, int sequence, WriterStatus* status) {
 
 int MWGetLastFailure(uint32_t set, WriterStatus* status) {
     return WithSet(set, [&](OptionSet& found) { return CopyStatus(found.LastFailure(), status); });
+}
+
+int MWGetThreadFileStatus(WriterStatus* status) {
+    return Guarded(0, [&] { return CopyStatus(t_record, status); });
 }
 
 unsigned MWGetVersion(void) {

@@ -56,7 +56,8 @@ enum {
     kWriterErrorWrite = 7,   ///< Another write failure; see nSystemError.
     kWriterErrorEncode = 8,  ///< An encoder or the multiplexer refused its input.
     kWriterErrorFinish = 9,  ///< Everything was written, but syncing or renaming failed; see nSystemError.
-    kWriterErrorInternal = 10 ///< Out of memory, or a fault of the writer.
+    kWriterErrorInternal = 10, ///< Out of memory, or a fault of the writer.
+    kWriterErrorRefused = 11   ///< None of the pictures, or none of the sound, could be taken as it was.
 };
 
 enum {
@@ -221,6 +222,10 @@ int MWGetFileStatus(uint32_t set, int sequence, WriterStatus* status);
 /// Copies the latest remembered status of the set that carries an error. Returns 1; 0 when none of its files
 /// has failed, and as MWGetFileStatus does.
 int MWGetLastFailure(uint32_t set, WriterStatus* status);
+
+/// Copies how the file stands that the calling thread created last, a refused one included, or has closed
+/// since. Returns 1; 0 when there is none or `status` is null or its size makes no sense.
+int MWGetThreadFileStatus(WriterStatus* status);
 
 /// The writer's version, as MC_MAKE_VERSION makes it. An engine of another major version refuses the writer.
 unsigned MWGetVersion(void);

@@ -42,12 +42,12 @@ std::vector<Case> Cases() {
     std::vector<Case> cases;
     cases.push_back({"Fine", MC_RESULT_DONE, kOutcomeCompleted});
     cases.push_back(
-        {"AWriteIsRefused", MC_RESULT_REFUSED, kOutcomeCompleted, 10, "did not take", {.takenWrites = 7}});
+        {"AWriteIsRefused", MC_RESULT_REFUSED, kOutcomeCompleted, 10, "not taken", {.takenWrites = 7}});
     cases.push_back({.name = "AWriteIsRefusedAndThatStops",
                      .category = MC_RESULT_REFUSED,
                      .outcome = kOutcomeStopped,
                      .pictures = 2,
-                     .what = "did not take",
+                     .what = "not taken",
                      .writer = {.takenWrites = 4},
                      .stopOnFailure = true});
     cases.push_back({"ACloseFails",
