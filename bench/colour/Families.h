@@ -11,8 +11,7 @@ namespace bench {
 
 constexpr int kSizes[][2] = {{640, 480}, {1920, 1080}, {3840, 2160}};
 
-/// How much faster than the peer a routine shall be at each of `kSizes`; zeroes where nothing is asked. With
-/// AVX-512 they are what a processor with two full 512-bit units can be expected to reach.
+/// How much faster than the peer a routine shall be at each of `kSizes`, on whatever level.
 using Goals = std::array<double, std::size(kSizes)>;
 
 /// What a routine does to the samples: whether it computes, and so gains from vectors, and from which cube of
@@ -25,8 +24,7 @@ struct Family {
     void (*ours)(Pictures&);
     const char* peerName;
     void (*peer)(Pictures&);
-    Goals goalsAvx2;
-    Goals goalsAvx512;
+    Goals goals;
     void (*accurate)(Pictures&) = nullptr; ///< By swscale; null where the routine computes no colours.
 };
 

@@ -41,12 +41,6 @@ std::string nameOf(const Size& size) {
     return std::to_string(size.width) + 'x' + std::to_string(size.height);
 }
 
-Goals goalsOf(const Family& family, const Level& level) {
-    if (level.kernels == image::KernelLevel::kAvx512)
-        return family.goalsAvx512;
-    return level.kernels == image::KernelLevel::kAvx2 ? family.goalsAvx2 : Goals{};
-}
-
 /// Registers one figure of a table; `body` compares the routine with something in the pictures of that size.
 template <class Body>
 void add(const std::string& question, const Level& level, const Family& family, const Size& size, double goal,
@@ -63,9 +57,8 @@ void add(const std::string& question, const Level& level, const Family& family, 
 }
 
 void addAgainstPeer(const Level& level, const Family& family) {
-    const Goals goals = goalsOf(family, level);
     for (std::size_t i = 0; i < std::size(kSizes); ++i)
-        add("Times faster than libyuv", level, family, {kSizes[i][0], kSizes[i][1]}, goals[i],
+        add("Times faster than libyuv", level, family, {kSizes[i][0], kSizes[i][1]}, family.goals[i],
             [](benchmark::State& state, const Family& f, Pictures& p) {
                 compare(
                     state, [&] { f.ours(p); }, [&] { f.peer(p); });
