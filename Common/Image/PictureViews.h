@@ -84,7 +84,7 @@ struct Picture {
 [[gnu::always_inline]] inline void PrefetchRow(const uint8_t* p, ptrdiff_t bytes) {
     constexpr ptrdiff_t kCacheLine = 64;
     for (ptrdiff_t i = 0; i < bytes; i += kCacheLine)
-        __builtin_prefetch(p + i);
+        __builtin_prefetch(p + i, 0, 2);
 }
 
 /// Calls visit(row0, row1, chromaRow) for every pair of rows. An odd last row comes as a pair with itself:
