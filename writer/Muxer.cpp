@@ -239,7 +239,7 @@ void Muxer::Write(AVPacket& packet, int stream) {
     }
     state.lastDts = packet_->dts;
     packet_->stream_index = stream;
-    const int64_t time = av_rescale_q(packet_->dts, out->time_base, AV_TIME_BASE_Q);
+    const int64_t time = av_rescale_q(packet_->dts, out->time_base, av_get_time_base_q());
     output_->max_interleave_delta = MostApart(packet_->size);
     // A cover never gets a second packet, for which the multiplexer would wait.
     const bool alone = coverStream_ >= 0 && streams_.size() == 1;
