@@ -37,6 +37,7 @@ struct MovieFacts {
     std::vector<TrackFacts> sounds;
     std::vector<TrackFacts> subtitles;
     int chapters = 0;
+    QStringList leftBehind; ///< What a conversion cannot carry over, a line each.
     int64_t bytes = 0;
 };
 
@@ -74,6 +75,7 @@ struct Order {
 struct Findings {
     bool targetExists = false;
     QStringList warnings;          ///< Sentences.
+    QStringList notes;             ///< Of less weight.
     std::optional<int64_t> needed; ///< Bytes.
     std::optional<int64_t> free;   ///< Bytes where the target goes.
 };

@@ -29,7 +29,7 @@ QString ActiveLine(const Figures& figures) {
 
 QString WaitingLine(const Entry& entry) {
     if (!entry.unusable.isEmpty())
-        return entry.unusable;
+        return Words::tr("Cannot be converted");
     QStringList parts;
     if (!entry.facts)
         parts += Words::tr("Looking at it…");

@@ -66,7 +66,8 @@ QString FailureSentence(const Failure& failure) {
 /// Hears a job and tells a listener in the window's terms.
 class Interpreter : public Observer {
 public:
-    explicit Interpreter(std::shared_ptr<RunListener> listener) : listener_(std::move(listener)) {}
+    Interpreter(std::shared_ptr<RunListener> listener, QStringList leftBehind)
+        : listener_(std::move(listener)), leftBehind_(std::move(leftBehind)) {}
 
     void StopWasAskedFor() { stopping_ = true; }
 
@@ -102,6 +103,8 @@ public:
                          : verdict.outcome == movieconv::Outcome::kStopped ? Ending::kStopped
                                                                            : Ending::kFailed;
         outcome.files = std::move(files_);
+        if (!outcome.files.empty())
+            outcome.notCarried = leftBehind_;
         outcome.bytes = verdict.bytes;
         outcome.position = verdict.position;
         outcome.worked = verdict.worked;
@@ -114,14 +117,15 @@ public:
 
 private:
     const std::shared_ptr<RunListener> listener_;
+    const QStringList leftBehind_;
     std::vector<std::string> files_;
     std::atomic<bool> stopping_{false};
 };
 
 class ConvertRun : public Run {
 public:
-    ConvertRun(Request request, std::shared_ptr<RunListener> listener, Worker& remover)
-        : parts_(std::make_shared<Parts>(std::move(request), std::move(listener))), remover_(remover) {}
+    ConvertRun(const Order& order, std::shared_ptr<RunListener> listener, Worker& remover)
+        : parts_(std::make_shared<Parts>(order, std::move(listener))), remover_(remover) {}
     ~ConvertRun() override {
         remover_.Do(0, [parts = std::move(parts_)]() mutable { parts.reset(); });
     }
@@ -147,8 +151,8 @@ public:
 
 private:
     struct Parts {
-        Parts(Request request, std::shared_ptr<RunListener> listener)
-            : interpreter(std::move(listener)), job(std::move(request), interpreter) {}
+        Parts(const Order& order, std::shared_ptr<RunListener> listener)
+            : interpreter(std::move(listener), order.facts.leftBehind), job(ToRequest(order), interpreter) {}
         Interpreter interpreter;
         Job job;
     };
@@ -157,12 +161,52 @@ private:
     Worker& remover_;
 };
 
-void TellAboutSound(const SoundStreamInfo& sound, MovieFacts& facts) {
+TrackFacts TrackOf(const StreamInfo& stream) {
     TrackFacts track;
-    track.number = sound.index;
-    track.details = QStringLiteral("%1, %2").arg(QString::fromStdString(sound.codec),
-                                                 QString::fromStdString(sound.layout));
-    facts.sounds.push_back(track);
+    track.number = stream.index;
+    track.language = QString::fromStdString(stream.language);
+    track.title = QString::fromStdString(stream.title);
+    track.details = QString::fromStdString(stream.codec);
+    if (stream.sound && !stream.sound->layout.empty())
+        track.details += QStringLiteral(", ") + QString::fromStdString(stream.sound->layout);
+    return track;
+}
+
+/// What a conversion leaves behind, a line each.
+QStringList LeftBehind(const SourceInfo& info) {
+    QStringList left;
+    for (const StreamInfo& stream : info.streams) {
+        const bool converted = (info.pictures && stream.index == info.pictures->index) ||
+                               (info.sound && stream.index == info.sound->index);
+        if (converted)
+            continue;
+        const QString line = TrackLine(TrackOf(stream));
+        switch (stream.kind) {
+        case StreamKind::kPictures:
+            left += Texts::tr("Pictures: %1").arg(line);
+            break;
+        case StreamKind::kSound:
+            left += Texts::tr("Sound track: %1").arg(line);
+            break;
+        case StreamKind::kSubtitles:
+            left += Texts::tr("Subtitles: %1").arg(line);
+            break;
+        case StreamKind::kCover:
+            left += Texts::tr("Cover picture");
+            break;
+        case StreamKind::kAttachment:
+            left += Texts::tr("Attached file: %1").arg(QString::fromStdString(stream.fileName));
+            break;
+        case StreamKind::kData:
+            left += Texts::tr("Data: %1").arg(line);
+            break;
+        }
+    }
+    if (!info.chapters.empty())
+        left += Texts::tr("%n chapters", "", static_cast<int>(info.chapters.size()));
+    if (!info.tags.empty())
+        left += Texts::tr("Title, date and other tags");
+    return left;
 }
 
 } // namespace
@@ -194,7 +238,7 @@ void ConvertRunner::SavePreset(const std::string&, const Wishes&) {
 }
 
 std::unique_ptr<Run> ConvertRunner::Start(const Order& order, std::shared_ptr<RunListener> listener) {
-    auto run = std::make_unique<ConvertRun>(ToRequest(order), std::move(listener), remover_);
+    auto run = std::make_unique<ConvertRun>(order, std::move(listener), remover_);
     run->Begin();
     return run;
 }
@@ -215,8 +259,14 @@ MovieFacts ConvertRunner::Look(const std::string& path) {
             facts.pictureCodec = QString::fromStdString(info.pictures->codec);
             facts.interlaced = info.pictures->interlaced;
         }
-        if (info.sound)
-            TellAboutSound(*info.sound, facts);
+        for (const StreamInfo& stream : info.streams) {
+            if (stream.kind == StreamKind::kSound)
+                facts.sounds.push_back(TrackOf(stream));
+            else if (stream.kind == StreamKind::kSubtitles)
+                facts.subtitles.push_back(TrackOf(stream));
+        }
+        facts.chapters = static_cast<int>(info.chapters.size());
+        facts.leftBehind = LeftBehind(info);
         return facts;
     } catch (const Failure& failure) {
         throw std::runtime_error(Sentence(failure.Text()).toStdString());
@@ -236,6 +286,9 @@ Findings ConvertRunner::Check(const Order& order) {
         findings.warnings += Texts::tr("There is a file of this name already.");
     else if (findings.targetExists)
         findings.warnings += Texts::tr("The file that exists will be replaced.");
+    if (!order.facts.leftBehind.isEmpty())
+        findings.notes +=
+            Texts::tr("Not carried over: %1").arg(order.facts.leftBehind.join(QStringLiteral("; ")));
     if (!fs::is_directory(folder, unknown)) {
         findings.warnings += Texts::tr("There is no folder “%1”.").arg(Readable(folder));
         return findings;

@@ -48,6 +48,7 @@ std::optional<T> ValueOf(const QComboBox& box) {
 void AddRow(QFormLayout& form, const QString& words, QWidget* field, const QString& description = {}) {
     auto* label = new QLabel(words);
     label->setBuddy(field);
+    label->setMinimumHeight(field->sizeHint().height()); // in the middle beside it
     field->setAccessibleName(QString(words).remove(QLatin1Char('&')));
     if (!description.isEmpty()) {
         field->setToolTip(description);
@@ -198,6 +199,8 @@ QWidget* EntryPage::MakeTarget() {
     findings_->setWordWrap(true);
     findings_->setTextFormat(Qt::PlainText);
     findings_->setAccessibleName(tr("Warnings"));
+    notes_ = MakeHint();
+    notes_->setAccessibleName(tr("Notes"));
     replace_ = new QCheckBox(tr("Replace the file that e&xists"));
     auto* row = new QHBoxLayout;
     row->addWidget(target_, 1);
@@ -208,6 +211,7 @@ QWidget* EntryPage::MakeTarget() {
     layout->setSpacing(6);
     layout->addLayout(row);
     layout->addWidget(findings_);
+    layout->addWidget(notes_);
     layout->addWidget(replace_);
     return target;
 }
@@ -424,6 +428,8 @@ void EntryPage::ShowFindings() {
     target_->setCursorPosition(static_cast<int>(target_->text().size()));
     findings_->setText(entry_.findings.warnings.join(QLatin1Char('\n')));
     findings_->setVisible(!entry_.findings.warnings.isEmpty());
+    notes_->setText(entry_.findings.notes.join(QLatin1Char('\n')));
+    notes_->setVisible(!entry_.findings.notes.isEmpty());
     QPalette colours = palette();
     colours.setColor(QPalette::WindowText, WarningColour(colours));
     findings_->setPalette(colours);

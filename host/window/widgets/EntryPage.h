@@ -86,6 +86,7 @@ private:
     QLineEdit* target_;
     QPushButton* browse_;
     QLabel* findings_;
+    QLabel* notes_;
     QCheckBox* replace_;
     QToolButton* more_;
     QComboBox* rate_;

@@ -56,6 +56,11 @@ double RangeStrip::TimeOf(int number) const {
     return length_ * (number + 0.5) / kPictures;
 }
 
+bool RangeStrip::IsFilled() const {
+    return std::none_of(pictures_.begin(), pictures_.end(),
+                        [](const QImage& picture) { return picture.isNull(); });
+}
+
 QRectF RangeStrip::Band() const {
     return QRectF(rect()).adjusted(kHandleWidth, 3, -kHandleWidth, -3);
 }

@@ -26,6 +26,9 @@ public:
     /// The time in the movie of a picture of the strip.
     double TimeOf(int number) const;
 
+    /// Whether all its pictures have come.
+    bool IsFilled() const;
+
     double Begin() const { return begin_; }
     /// Nothing: the movie's end.
     std::optional<double> End() const { return end_; }

@@ -11,9 +11,9 @@
 #include <map>
 #include <mutex>
 
-/// Handles the window's events until `condition` holds. False after a minute.
+/// Handles the window's events until `condition` holds. False after five minutes.
 inline bool Await(const std::function<bool()>& condition) {
-    return QTest::qWaitFor(condition, 60'000);
+    return QTest::qWaitFor(condition, 300'000);
 }
 
 class ScriptedRunner : public movieconv::window::Runner {

@@ -1,0 +1,1079 @@
+<?xml version="1.0" encoding="utf-8"?>
+<!DOCTYPE TS>
+<TS version="2.1" language="de" sourcelanguage="en">
+<context>
+    <name>ConvertRunner</name>
+    <message>
+        <source>There was not enough memory.</source>
+        <translation>Der Arbeitsspeicher reichte nicht.</translation>
+    </message>
+    <message>
+        <source>Choose another name, or let it be replaced.</source>
+        <translation>Einen anderen Namen wählen oder die Datei ersetzen lassen.</translation>
+    </message>
+    <message>
+        <source>Make room on the disk, or choose another folder.</source>
+        <translation>Platz auf dem Datenträger schaffen oder einen anderen Ordner wählen.</translation>
+    </message>
+    <message>
+        <source>Choose another folder that you may write to.</source>
+        <translation>Einen anderen Ordner wählen, in den geschrieben werden darf.</translation>
+    </message>
+    <message>
+        <source>It was stopped before anything was converted.</source>
+        <translation>Es wurde abgebrochen, bevor etwas umgewandelt war.</translation>
+    </message>
+    <message>
+        <source>The new file cannot take the place of its source. Choose another name.</source>
+        <translation>Die neue Datei kann nicht an die Stelle ihrer Quelle treten. Bitte einen anderen Namen wählen.</translation>
+    </message>
+    <message>
+        <source>There is a file of this name already.</source>
+        <translation>Eine Datei dieses Namens gibt es schon.</translation>
+    </message>
+    <message>
+        <source>The file that exists will be replaced.</source>
+        <translation>Die vorhandene Datei wird ersetzt.</translation>
+    </message>
+    <message>
+        <source>There is no folder “%1”.</source>
+        <translation>Den Ordner „%1“ gibt es nicht.</translation>
+    </message>
+    <message>
+        <source>About %1 are needed, but only %2 are free in “%3”.</source>
+        <translation>Etwa %1 werden gebraucht, aber nur %2 sind in „%3“ frei.</translation>
+    </message>
+    <message>
+        <source>Pictures: %1</source>
+        <translation>Bilder: %1</translation>
+    </message>
+    <message>
+        <source>Sound track: %1</source>
+        <translation>Tonspur: %1</translation>
+    </message>
+    <message>
+        <source>Subtitles: %1</source>
+        <translation>Untertitel: %1</translation>
+    </message>
+    <message>
+        <source>Cover picture</source>
+        <translation>Titelbild</translation>
+    </message>
+    <message>
+        <source>Attached file: %1</source>
+        <translation>Angehängte Datei: %1</translation>
+    </message>
+    <message>
+        <source>Data: %1</source>
+        <translation>Daten: %1</translation>
+    </message>
+    <message numerus="yes">
+        <source>%n chapters</source>
+        <translation>
+            <numerusform>ein Kapitel</numerusform>
+            <numerusform>%n Kapitel</numerusform>
+        </translation>
+    </message>
+    <message>
+        <source>Title, date and other tags</source>
+        <translation>Titel, Datum und andere Angaben</translation>
+    </message>
+    <message>
+        <source>Not carried over: %1</source>
+        <translation>Nicht übernommen: %1</translation>
+    </message>
+</context>
+<context>
+    <name>Intake</name>
+    <message>
+        <source>There are no movies in the folder “%1”.</source>
+        <translation>Im Ordner „%1“ sind keine Filme.</translation>
+    </message>
+    <message>
+        <source>“%1” is neither a file nor a folder.</source>
+        <translation>„%1“ ist weder Datei noch Ordner.</translation>
+    </message>
+    <message>
+        <source>“%1” was not found.</source>
+        <translation>„%1“ wurde nicht gefunden.</translation>
+    </message>
+</context>
+<context>
+    <name>Journal</name>
+    <message>
+        <source>The saved queue could not be read. It was kept as %1.</source>
+        <translation>Die gespeicherte Warteschlange war nicht lesbar. Sie wurde als %1 aufgehoben.</translation>
+    </message>
+    <message>
+        <source>The queue cannot be saved in %1: %2. It will be lost when the program ends.</source>
+        <translation>Die Warteschlange kann nicht in %1 gespeichert werden: %2. Sie geht mit dem Ende des Programms verloren.</translation>
+    </message>
+</context>
+<context>
+    <name>Presets</name>
+    <message>
+        <source>Standard</source>
+        <translation>Standard</translation>
+    </message>
+    <message>
+        <source>Looks like the source and plays on nearly everything (H.264, AAC).</source>
+        <translation>Sieht aus wie die Quelle und läuft fast überall (H.264, AAC).</translation>
+    </message>
+    <message>
+        <source>Small</source>
+        <translation>Klein</translation>
+    </message>
+    <message>
+        <source>Half the size at nearly the same quality, and slower (HEVC, AAC).</source>
+        <translation>Halb so groß bei fast gleicher Qualität, dafür langsamer (HEVC, AAC).</translation>
+    </message>
+    <message>
+        <source>Web</source>
+        <translation>Web</translation>
+    </message>
+    <message>
+        <source>For web pages, in formats that are free of patents (VP9, Opus).</source>
+        <translation>Für Webseiten, in patentfreien Formaten (VP9, Opus).</translation>
+    </message>
+    <message>
+        <source>Phone</source>
+        <translation>Telefon</translation>
+    </message>
+    <message>
+        <source>Small pictures for small screens (H.264 up to 720 lines, AAC).</source>
+        <translation>Kleine Bilder für kleine Bildschirme (H.264 bis 720 Zeilen, AAC).</translation>
+    </message>
+    <message>
+        <source>Sound alone</source>
+        <translation>Nur Ton</translation>
+    </message>
+    <message>
+        <source>Leaves the pictures out (AAC).</source>
+        <translation>Lässt die Bilder weg (AAC).</translation>
+    </message>
+</context>
+<context>
+    <name>Words</name>
+    <message>
+        <source>%1 %</source>
+        <translation>%1 %</translation>
+    </message>
+    <message>
+        <source>%1 left</source>
+        <translation>noch %1</translation>
+    </message>
+    <message>
+        <source>Looking at it…</source>
+        <translation>Wird angesehen …</translation>
+    </message>
+    <message>
+        <source>to %1</source>
+        <translation>nach %1</translation>
+    </message>
+    <message>
+        <source>a few seconds</source>
+        <translation>ein paar Sekunden</translation>
+    </message>
+    <message>
+        <source>less than a minute</source>
+        <translation>weniger als eine Minute</translation>
+    </message>
+    <message numerus="yes">
+        <source>about %n minutes</source>
+        <translation>
+            <numerusform>etwa eine Minute</numerusform>
+            <numerusform>etwa %n Minuten</numerusform>
+        </translation>
+    </message>
+    <message>
+        <source>about %1 h %2 min</source>
+        <translation>etwa %1 h %2 min</translation>
+    </message>
+    <message>
+        <source>%1×</source>
+        <translation>%1×</translation>
+    </message>
+    <message>
+        <source>%1 pictures a second</source>
+        <translation>%1 Bilder je Sekunde</translation>
+    </message>
+    <message>
+        <source>Track %1</source>
+        <translation>Spur %1</translation>
+    </message>
+    <message>
+        <source>Starting…</source>
+        <translation>Beginnt …</translation>
+    </message>
+    <message>
+        <source>Converting</source>
+        <translation>Wird umgewandelt</translation>
+    </message>
+    <message>
+        <source>Paused</source>
+        <translation>Angehalten</translation>
+    </message>
+    <message>
+        <source>The disk is full: waiting for room</source>
+        <translation>Der Datenträger ist voll: wartet auf Platz</translation>
+    </message>
+    <message>
+        <source>Finishing the file…</source>
+        <translation>Die Datei wird fertiggestellt …</translation>
+    </message>
+    <message>
+        <source>Stopping, keeping what is done…</source>
+        <translation>Wird abgebrochen, Fertiges bleibt …</translation>
+    </message>
+    <message>
+        <source>Done · %1</source>
+        <translation>Fertig · %1</translation>
+    </message>
+    <message>
+        <source>Stopped after %1</source>
+        <translation>Abgebrochen nach %1</translation>
+    </message>
+    <message>
+        <source>Interrupted when the program ended</source>
+        <translation>Vom Ende des Programms unterbrochen</translation>
+    </message>
+    <message>
+        <source>Cannot be converted</source>
+        <translation>Kann nicht umgewandelt werden</translation>
+    </message>
+</context>
+<context>
+    <name>movieconv::window::App</name>
+    <message numerus="yes">
+        <source>%n movies were converted.</source>
+        <translation>
+            <numerusform>Ein Film wurde umgewandelt.</numerusform>
+            <numerusform>%n Filme wurden umgewandelt.</numerusform>
+        </translation>
+    </message>
+    <message numerus="yes">
+        <source>%n could not be converted.</source>
+        <translation>
+            <numerusform>Einer konnte nicht umgewandelt werden.</numerusform>
+            <numerusform>%n konnten nicht umgewandelt werden.</numerusform>
+        </translation>
+    </message>
+    <message>
+        <source>Conversion done</source>
+        <translation>Umwandlung fertig</translation>
+    </message>
+    <message>
+        <source>Conversion done, with failures</source>
+        <translation>Umwandlung fertig, mit Fehlern</translation>
+    </message>
+</context>
+<context>
+    <name>movieconv::window::EntryPage</name>
+    <message>
+        <source>Why it cannot be converted</source>
+        <translation>Warum der Film nicht umgewandelt werden kann</translation>
+    </message>
+    <message>
+        <source>As the preset has it</source>
+        <translation>Wie in der Vorlage</translation>
+    </message>
+    <message>
+        <source>P&amp;reset</source>
+        <translation>Vo&amp;rlage</translation>
+    </message>
+    <message>
+        <source>&amp;File format</source>
+        <translation>Datei&amp;format</translation>
+    </message>
+    <message>
+        <source>Picture &amp;size</source>
+        <translation>Bild&amp;größe</translation>
+    </message>
+    <message>
+        <source>&amp;Quality</source>
+        <translation>&amp;Qualität</translation>
+    </message>
+    <message>
+        <source>Quality</source>
+        <translation>Qualität</translation>
+    </message>
+    <message>
+        <source>To the left small files, to the right good pictures.</source>
+        <translation>Links kleine Dateien, rechts gute Bilder.</translation>
+    </message>
+    <message>
+        <source>Range</source>
+        <translation>Ausschnitt</translation>
+    </message>
+    <message>
+        <source>Save as</source>
+        <translation>Speichern als</translation>
+    </message>
+    <message>
+        <source>Begin of the range</source>
+        <translation>Anfang des Ausschnitts</translation>
+    </message>
+    <message>
+        <source>End of the range</source>
+        <translation>Ende des Ausschnitts</translation>
+    </message>
+    <message>
+        <source>Hours, minutes and seconds, such as 1:02:03</source>
+        <translation>Stunden, Minuten und Sekunden, etwa 1:02:03</translation>
+    </message>
+    <message>
+        <source>f&amp;rom</source>
+        <translation>v&amp;on</translation>
+    </message>
+    <message>
+        <source>t&amp;o</source>
+        <translation>b&amp;is</translation>
+    </message>
+    <message>
+        <source>Sound tracks</source>
+        <translation>Tonspuren</translation>
+    </message>
+    <message>
+        <source>Subtitles</source>
+        <translation>Untertitel</translation>
+    </message>
+    <message>
+        <source>File to save as</source>
+        <translation>Datei, in die gespeichert wird</translation>
+    </message>
+    <message>
+        <source>By the naming rules</source>
+        <translation>Nach den Namensregeln</translation>
+    </message>
+    <message>
+        <source>Back to the naming rules</source>
+        <translation>Zurück zu den Namensregeln</translation>
+    </message>
+    <message>
+        <source>C&amp;hoose…</source>
+        <translation>&amp;Wählen …</translation>
+    </message>
+    <message>
+        <source>Choose the file to save as</source>
+        <translation>Die Datei wählen, in die gespeichert wird</translation>
+    </message>
+    <message>
+        <source>Warnings</source>
+        <translation>Warnungen</translation>
+    </message>
+    <message>
+        <source>Replace the file that e&amp;xists</source>
+        <translation>Die vorhandene Datei ers&amp;etzen</translation>
+    </message>
+    <message>
+        <source>&amp;More</source>
+        <translation>&amp;Mehr</translation>
+    </message>
+    <message>
+        <source>Shows or hides the settings that are seldom needed</source>
+        <translation>Zeigt oder verbirgt, was selten gebraucht wird</translation>
+    </message>
+    <message>
+        <source>Cut &amp;black borders off</source>
+        <translation>&amp;Schwarze Ränder abschneiden</translation>
+    </message>
+    <message>
+        <source>P&amp;ictures</source>
+        <translation>B&amp;ilder</translation>
+    </message>
+    <message>
+        <source>Soun&amp;d</source>
+        <translation>&amp;Ton</translation>
+    </message>
+    <message>
+        <source>Pictures a seco&amp;nd</source>
+        <translation>Bilder je Seku&amp;nde</translation>
+    </message>
+    <message>
+        <source>Sound c&amp;hannels</source>
+        <translation>Ton&amp;kanäle</translation>
+    </message>
+    <message>
+        <source>Cut into c&amp;lips</source>
+        <translation>In C&amp;lips teilen</translation>
+    </message>
+    <message>
+        <source>Writes several files, each of that length.</source>
+        <translation>Schreibt mehrere Dateien von dieser Länge.</translation>
+    </message>
+    <message>
+        <source>Deinterlac&amp;e</source>
+        <translation>&amp;Zeilensprung entfernen</translation>
+    </message>
+    <message>
+        <source>Repairs the combs of old television pictures.</source>
+        <translation>Beseitigt die Kammstreifen alter Fernsehbilder.</translation>
+    </message>
+    <message>
+        <source>Convert</source>
+        <translation>Umwandeln</translation>
+    </message>
+    <message>
+        <source>&amp;Use for all that wait</source>
+        <translation>Für alle &amp;Wartenden verwenden</translation>
+    </message>
+    <message>
+        <source>Gives every waiting movie these settings; ranges and tracks stay as they are.</source>
+        <translation>Gibt allen wartenden Filmen diese Einstellungen; Ausschnitte und Spuren bleiben, wie sie sind.</translation>
+    </message>
+    <message>
+        <source>Sa&amp;ve as preset…</source>
+        <translation>Als &amp;Vorlage speichern …</translation>
+    </message>
+    <message>
+        <source>Load prese&amp;t…</source>
+        <translation>Vorlage la&amp;den …</translation>
+    </message>
+    <message>
+        <source>As the source</source>
+        <translation>Wie die Quelle</translation>
+    </message>
+    <message>
+        <source>%1 lines</source>
+        <translation>%1 Zeilen</translation>
+    </message>
+    <message>
+        <source>Mono</source>
+        <translation>Mono</translation>
+    </message>
+    <message>
+        <source>Stereo</source>
+        <translation>Stereo</translation>
+    </message>
+    <message>
+        <source>No, one file</source>
+        <translation>Nein, eine Datei</translation>
+    </message>
+    <message numerus="yes">
+        <source>Of %n minutes</source>
+        <translation>
+            <numerusform>Von einer Minute</numerusform>
+            <numerusform>Von %n Minuten</numerusform>
+        </translation>
+    </message>
+    <message>
+        <source>Where the source says so</source>
+        <translation>Wo die Quelle es angibt</translation>
+    </message>
+    <message>
+        <source>Never</source>
+        <translation>Nie</translation>
+    </message>
+    <message>
+        <source>Everything</source>
+        <translation>Alles</translation>
+    </message>
+    <message>
+        <source>Looking at it…</source>
+        <translation>Wird angesehen …</translation>
+    </message>
+    <message>
+        <source>The preset's (.%1)</source>
+        <translation>Das der Vorlage (.%1)</translation>
+    </message>
+    <message>
+        <source>The preset's</source>
+        <translation>Das der Vorlage</translation>
+    </message>
+    <message>
+        <source>As the source (%1 × %2)</source>
+        <translation>Wie die Quelle (%1 × %2)</translation>
+    </message>
+    <message>
+        <source>Small file</source>
+        <translation>Kleine Datei</translation>
+    </message>
+    <message>
+        <source>Balanced</source>
+        <translation>Ausgewogen</translation>
+    </message>
+    <message>
+        <source>Good pictures</source>
+        <translation>Gute Bilder</translation>
+    </message>
+    <message>
+        <source>Notes</source>
+        <translation>Hinweise</translation>
+    </message>
+</context>
+<context>
+    <name>movieconv::window::LogPanel</name>
+    <message>
+        <source>Shows or hides what happened during the conversion</source>
+        <translation>Zeigt oder verbirgt, was während der Umwandlung geschah</translation>
+    </message>
+    <message>
+        <source>Log of the conversion</source>
+        <translation>Protokoll der Umwandlung</translation>
+    </message>
+    <message numerus="yes">
+        <source>&amp;Log (%n lines)</source>
+        <translation>
+            <numerusform>&amp;Protokoll (eine Zeile)</numerusform>
+            <numerusform>&amp;Protokoll (%n Zeilen)</numerusform>
+        </translation>
+    </message>
+</context>
+<context>
+    <name>movieconv::window::MainWindow</name>
+    <message>
+        <source>MovieConv</source>
+        <translation>MovieConv</translation>
+    </message>
+    <message numerus="yes">
+        <source>%n movies were being converted when the program ended.</source>
+        <translation>
+            <numerusform>Ein Film wurde gerade umgewandelt, als das Programm endete.</numerusform>
+            <numerusform>%n Filme wurden gerade umgewandelt, als das Programm endete.</numerusform>
+        </translation>
+    </message>
+    <message>
+        <source>Convert again</source>
+        <translation>Noch einmal umwandeln</translation>
+    </message>
+    <message>
+        <source>Movies and sound</source>
+        <translation>Filme und Ton</translation>
+    </message>
+    <message>
+        <source>All files</source>
+        <translation>Alle Dateien</translation>
+    </message>
+    <message>
+        <source>Open movies</source>
+        <translation>Filme öffnen</translation>
+    </message>
+    <message>
+        <source>Open a folder with movies</source>
+        <translation>Einen Ordner mit Filmen öffnen</translation>
+    </message>
+    <message>
+        <source>Save the settings as a preset</source>
+        <translation>Die Einstellungen als Vorlage speichern</translation>
+    </message>
+    <message>
+        <source>Presets (*.json)</source>
+        <translation>Vorlagen (*.json)</translation>
+    </message>
+    <message>
+        <source>Load a preset</source>
+        <translation>Eine Vorlage laden</translation>
+    </message>
+    <message>
+        <source>%1 of %2 done</source>
+        <translation>%1 von %2 fertig</translation>
+    </message>
+    <message numerus="yes">
+        <source>%n failed</source>
+        <translation>
+            <numerusform>einer misslungen</numerusform>
+            <numerusform>%n misslungen</numerusform>
+        </translation>
+    </message>
+    <message>
+        <source>paused</source>
+        <translation>angehalten</translation>
+    </message>
+    <message>
+        <source>%1 left for all</source>
+        <translation>noch %1 für alle</translation>
+    </message>
+    <message>
+        <source>stops after this one</source>
+        <translation>hält nach diesem an</translation>
+    </message>
+    <message numerus="yes">
+        <source>%n movies are ready</source>
+        <translation>
+            <numerusform>Ein Film ist bereit</numerusform>
+            <numerusform>%n Filme sind bereit</numerusform>
+        </translation>
+    </message>
+    <message>
+        <source>%1 % – MovieConv</source>
+        <translation>%1 % – MovieConv</translation>
+    </message>
+    <message>
+        <source>&amp;Resume</source>
+        <translation>&amp;Fortsetzen</translation>
+    </message>
+    <message>
+        <source>&amp;Pause</source>
+        <translation>An&amp;halten</translation>
+    </message>
+    <message>
+        <source>Resume</source>
+        <translation>Fortsetzen</translation>
+    </message>
+    <message>
+        <source>Convert</source>
+        <translation>Umwandeln</translation>
+    </message>
+    <message>
+        <source>The disk with “%1” is full. Make room, and the conversion goes on by itself; or stop it and keep what is done.</source>
+        <translation>Der Datenträger mit „%1“ ist voll. Sobald Platz ist, geht die Umwandlung von selbst weiter; oder abbrechen und behalten, was fertig ist.</translation>
+    </message>
+    <message>
+        <source>Movies are being converted. What is converted so far can be kept as it is.</source>
+        <translation>Es werden gerade Filme umgewandelt. Was bisher fertig ist, kann behalten werden.</translation>
+    </message>
+    <message>
+        <source>Stop and close</source>
+        <translation>Abbrechen und schließen</translation>
+    </message>
+    <message>
+        <source>Close when done</source>
+        <translation>Schließen, wenn fertig</translation>
+    </message>
+    <message>
+        <source>Go on</source>
+        <translation>Weitermachen</translation>
+    </message>
+    <message>
+        <source>“%1” is not a file on this machine.</source>
+        <translation>„%1“ ist keine Datei auf diesem Rechner.</translation>
+    </message>
+    <message>
+        <source>&amp;Movies</source>
+        <translation>&amp;Filme</translation>
+    </message>
+    <message>
+        <source>&amp;Open movies…</source>
+        <translation>Filme ö&amp;ffnen …</translation>
+    </message>
+    <message>
+        <source>Open a &amp;folder…</source>
+        <translation>Einen &amp;Ordner öffnen …</translation>
+    </message>
+    <message>
+        <source>Ctrl+Shift+O</source>
+        <translation>Ctrl+Shift+O</translation>
+    </message>
+    <message>
+        <source>&amp;Names and folder of new files…</source>
+        <translation>&amp;Namen und Ordner neuer Dateien …</translation>
+    </message>
+    <message>
+        <source>Ctrl+N</source>
+        <translation>Ctrl+N</translation>
+    </message>
+    <message>
+        <source>&amp;Quit</source>
+        <translation>&amp;Beenden</translation>
+    </message>
+    <message>
+        <source>&amp;Queue</source>
+        <translation>&amp;Warteschlange</translation>
+    </message>
+    <message>
+        <source>Move &amp;up</source>
+        <translation>Nach o&amp;ben</translation>
+    </message>
+    <message>
+        <source>Ctrl+Up</source>
+        <translation>Ctrl+Up</translation>
+    </message>
+    <message>
+        <source>Move &amp;down</source>
+        <translation>Nach &amp;unten</translation>
+    </message>
+    <message>
+        <source>Ctrl+Down</source>
+        <translation>Ctrl+Down</translation>
+    </message>
+    <message>
+        <source>Convert &amp;again</source>
+        <translation>Noch &amp;einmal umwandeln</translation>
+    </message>
+    <message>
+        <source>Ctrl+R</source>
+        <translation>Ctrl+R</translation>
+    </message>
+    <message>
+        <source>&amp;Play the converted movie</source>
+        <translation>Den fertigen Film ab&amp;spielen</translation>
+    </message>
+    <message>
+        <source>Ctrl+Shift+P</source>
+        <translation>Ctrl+Shift+P</translation>
+    </message>
+    <message>
+        <source>Show in &amp;folder</source>
+        <translation>Im &amp;Ordner zeigen</translation>
+    </message>
+    <message>
+        <source>Ctrl+Shift+F</source>
+        <translation>Ctrl+Shift+F</translation>
+    </message>
+    <message>
+        <source>&amp;Remove</source>
+        <translation>En&amp;tfernen</translation>
+    </message>
+    <message>
+        <source>Remove what is &amp;over</source>
+        <translation>Er&amp;ledigtes entfernen</translation>
+    </message>
+    <message>
+        <source>Ctrl+Shift+Del</source>
+        <translation>Ctrl+Shift+Del</translation>
+    </message>
+    <message>
+        <source>&amp;Conversion</source>
+        <translation>&amp;Umwandlung</translation>
+    </message>
+    <message>
+        <source>&amp;Convert</source>
+        <translation>&amp;Umwandeln</translation>
+    </message>
+    <message>
+        <source>Ctrl+Return</source>
+        <translation>Ctrl+Return</translation>
+    </message>
+    <message>
+        <source>Ctrl+P</source>
+        <translation>Ctrl+P</translation>
+    </message>
+    <message>
+        <source>&amp;Stop everything</source>
+        <translation>Alles a&amp;bbrechen</translation>
+    </message>
+    <message>
+        <source>Ctrl+.</source>
+        <translation>Ctrl+.</translation>
+    </message>
+    <message>
+        <source>Stop &amp;after this one</source>
+        <translation>&amp;Nach diesem anhalten</translation>
+    </message>
+    <message>
+        <source>Ctrl+E</source>
+        <translation>Ctrl+E</translation>
+    </message>
+    <message>
+        <source>At the same &amp;time</source>
+        <translation>&amp;Gleichzeitig</translation>
+    </message>
+    <message>
+        <source>When &amp;everything is done</source>
+        <translation>Wenn alles fertig i&amp;st</translation>
+    </message>
+    <message numerus="yes">
+        <source>%n movies</source>
+        <translation>
+            <numerusform>Ein Film</numerusform>
+            <numerusform>%n Filme</numerusform>
+        </translation>
+    </message>
+    <message>
+        <source>Play a &amp;sound</source>
+        <translation>Einen &amp;Ton abspielen</translation>
+    </message>
+    <message>
+        <source>Stay &amp;open</source>
+        <translation>&amp;Offen bleiben</translation>
+    </message>
+    <message>
+        <source>S&amp;uspend the machine</source>
+        <translation>Den &amp;Rechner schlafen legen</translation>
+    </message>
+    <message>
+        <source>&amp;Help</source>
+        <translation>&amp;Hilfe</translation>
+    </message>
+    <message>
+        <source>&amp;About MovieConv</source>
+        <translation>Ü&amp;ber MovieConv</translation>
+    </message>
+    <message>
+        <source>About MovieConv</source>
+        <translation>Über MovieConv</translation>
+    </message>
+    <message>
+        <source>MovieConv %1 converts movies.</source>
+        <translation>MovieConv %1 wandelt Filme um.</translation>
+    </message>
+    <message>
+        <source>Drop movies here</source>
+        <translation>Filme hierher ziehen</translation>
+    </message>
+    <message>
+        <source>Drop movies or folders here, choose what they shall become, and press Convert.</source>
+        <translation>Filme oder Ordner hierher ziehen, wählen, was aus ihnen werden soll, und auf Umwandeln drücken.</translation>
+    </message>
+    <message>
+        <source>How the queue stands</source>
+        <translation>Stand der Warteschlange</translation>
+    </message>
+    <message>
+        <source>Progress of the queue</source>
+        <translation>Fortschritt der Warteschlange</translation>
+    </message>
+    <message>
+        <source>A&amp;dd movies…</source>
+        <translation>Filme hin&amp;zufügen …</translation>
+    </message>
+    <message>
+        <source>Pause</source>
+        <translation>Anhalten</translation>
+    </message>
+    <message>
+        <source>Stop</source>
+        <translation>Abbrechen</translation>
+    </message>
+    <message>
+        <source>Pauses everything</source>
+        <translation>Hält alles an</translation>
+    </message>
+    <message>
+        <source>Stops everything; what is converted is kept</source>
+        <translation>Bricht alles ab; was fertig ist, bleibt</translation>
+    </message>
+    <message>
+        <source>Converts all movies that wait</source>
+        <translation>Wandelt alle wartenden Filme um</translation>
+    </message>
+</context>
+<context>
+    <name>movieconv::window::NamingDialog</name>
+    <message>
+        <source>&amp;Beside the source</source>
+        <translation>&amp;Neben der Quelle</translation>
+    </message>
+    <message>
+        <source>In this &amp;folder:</source>
+        <translation>In diesem &amp;Ordner:</translation>
+    </message>
+    <message>
+        <source>Names and folder of new files</source>
+        <translation>Namen und Ordner neuer Dateien</translation>
+    </message>
+    <message>
+        <source>Pattern of the names</source>
+        <translation>Muster der Namen</translation>
+    </message>
+    <message>
+        <source>{name}, {preset}, {height} and {date} are filled in.</source>
+        <translation>{name}, {preset}, {height} und {date} werden ersetzt.</translation>
+    </message>
+    <message>
+        <source>Folder for new files</source>
+        <translation>Ordner für neue Dateien</translation>
+    </message>
+    <message>
+        <source>C&amp;hoose…</source>
+        <translation>&amp;Wählen …</translation>
+    </message>
+    <message>
+        <source>Choose the folder for new files</source>
+        <translation>Den Ordner für neue Dateien wählen</translation>
+    </message>
+    <message>
+        <source>&amp;Name</source>
+        <translation>N&amp;ame</translation>
+    </message>
+    <message>
+        <source>Folder</source>
+        <translation>Ordner</translation>
+    </message>
+    <message>
+        <source>/Holidays/beach.mov</source>
+        <translation>/Urlaub/Strand.mov</translation>
+    </message>
+    <message>
+        <source>For example: %1</source>
+        <translation>Zum Beispiel: %1</translation>
+    </message>
+</context>
+<context>
+    <name>movieconv::window::NoticeBar</name>
+    <message>
+        <source>Dismiss</source>
+        <translation>Schließen</translation>
+    </message>
+    <message>
+        <source>Dismiss the notice</source>
+        <translation>Den Hinweis schließen</translation>
+    </message>
+</context>
+<context>
+    <name>movieconv::window::Notifier</name>
+    <message>
+        <source>Show</source>
+        <translation>Zeigen</translation>
+    </message>
+</context>
+<context>
+    <name>movieconv::window::OverPage</name>
+    <message>
+        <source>Done</source>
+        <translation>Fertig</translation>
+    </message>
+    <message>
+        <source>Stopped</source>
+        <translation>Abgebrochen</translation>
+    </message>
+    <message>
+        <source>This did not work</source>
+        <translation>Das hat nicht geklappt</translation>
+    </message>
+    <message>
+        <source>Interrupted</source>
+        <translation>Unterbrochen</translation>
+    </message>
+    <message>
+        <source>%1 converted in %2 (%3)</source>
+        <translation>%1 in %2 umgewandelt (%3)</translation>
+    </message>
+    <message numerus="yes">
+        <source>%n files</source>
+        <translation>
+            <numerusform>eine Datei</numerusform>
+            <numerusform>%n Dateien</numerusform>
+        </translation>
+    </message>
+    <message>
+        <source>&amp;Play the movie</source>
+        <translation>Film ab&amp;spielen</translation>
+    </message>
+    <message>
+        <source>Show in &amp;folder</source>
+        <translation>Im &amp;Ordner zeigen</translation>
+    </message>
+    <message>
+        <source>Convert &amp;again</source>
+        <translation>Noch &amp;einmal umwandeln</translation>
+    </message>
+    <message>
+        <source>What became of the movie</source>
+        <translation>Was aus dem Film wurde</translation>
+    </message>
+    <message>
+        <source>What was not carried over</source>
+        <translation>Was nicht übernommen wurde</translation>
+    </message>
+    <message>
+        <source>Puts the movie back into the queue.</source>
+        <translation>Stellt den Film wieder in die Warteschlange.</translation>
+    </message>
+    <message>
+        <source>State</source>
+        <translation>Zustand</translation>
+    </message>
+    <message>
+        <source>The program ended while this movie was being converted. Convert it again?</source>
+        <translation>Das Programm endete, während dieser Film umgewandelt wurde. Noch einmal umwandeln?</translation>
+    </message>
+    <message>
+        <source>The movie is in “%1”.</source>
+        <translation>Der Film liegt in „%1“.</translation>
+    </message>
+    <message>
+        <source>Not carried over:</source>
+        <translation>Nicht übernommen:</translation>
+    </message>
+</context>
+<context>
+    <name>movieconv::window::PictureView</name>
+    <message>
+        <source>The picture that is being converted</source>
+        <translation>Das Bild, das gerade umgewandelt wird</translation>
+    </message>
+</context>
+<context>
+    <name>movieconv::window::QueueView</name>
+    <message>
+        <source>Movies to convert</source>
+        <translation>Filme zum Umwandeln</translation>
+    </message>
+</context>
+<context>
+    <name>movieconv::window::RangeStrip</name>
+    <message>
+        <source>Range</source>
+        <translation>Ausschnitt</translation>
+    </message>
+    <message>
+        <source>B and E choose the begin or the end, the arrow keys move it by a second.</source>
+        <translation>B und E wählen Anfang oder Ende, die Pfeiltasten bewegen es um eine Sekunde.</translation>
+    </message>
+    <message>
+        <source>Drag the ends to convert a part of the movie.</source>
+        <translation>Die Enden ziehen, um einen Teil des Films umzuwandeln.</translation>
+    </message>
+</context>
+<context>
+    <name>movieconv::window::SleepGuard</name>
+    <message>
+        <source>Movies are being converted</source>
+        <translation>Es werden Filme umgewandelt</translation>
+    </message>
+    <message>
+        <source>The machine may go to sleep while movies are converted: %1</source>
+        <translation>Der Rechner könnte während der Umwandlung einschlafen: %1</translation>
+    </message>
+</context>
+<context>
+    <name>movieconv::window::WorkPage</name>
+    <message>
+        <source>S&amp;top</source>
+        <translation>Ab&amp;brechen</translation>
+    </message>
+    <message>
+        <source>Progress of the movie</source>
+        <translation>Fortschritt des Films</translation>
+    </message>
+    <message>
+        <source>Pauses or resumes this movie</source>
+        <translation>Hält diesen Film an oder setzt ihn fort</translation>
+    </message>
+    <message>
+        <source>Stops this movie; what is converted is kept.</source>
+        <translation>Bricht diesen Film ab; was fertig ist, bleibt.</translation>
+    </message>
+    <message>
+        <source>Progress in percent</source>
+        <translation>Fortschritt in Prozent</translation>
+    </message>
+    <message>
+        <source>What happens now</source>
+        <translation>Was gerade geschieht</translation>
+    </message>
+    <message>
+        <source>Time left</source>
+        <translation>Restzeit</translation>
+    </message>
+    <message>
+        <source>Speed</source>
+        <translation>Geschwindigkeit</translation>
+    </message>
+    <message>
+        <source>Converted</source>
+        <translation>Umgewandelt</translation>
+    </message>
+    <message>
+        <source>Written</source>
+        <translation>Geschrieben</translation>
+    </message>
+    <message>
+        <source>%1 %</source>
+        <translation>%1 %</translation>
+    </message>
+    <message>
+        <source>%1 of %2</source>
+        <translation>%1 von %2</translation>
+    </message>
+    <message>
+        <source>&amp;Resume</source>
+        <translation>&amp;Fortsetzen</translation>
+    </message>
+    <message>
+        <source>&amp;Pause</source>
+        <translation>An&amp;halten</translation>
+    </message>
+</context>
+</TS>
