@@ -12,8 +12,8 @@ constexpr int kBufferSize = 128 * 1024;
 
 } // namespace
 
-AvioFile::AvioFile(std::shared_ptr<ByteFile> file, Mode mode, FullDiskHandler onFull)
-    : file_(std::move(file)), onFull_(std::move(onFull)) {
+AvioFile::AvioFile(std::shared_ptr<ByteFile> file, Mode mode, FullDiskHandler onFull, Tap tap)
+    : file_(std::move(file)), onFull_(std::move(onFull)), tap_(std::move(tap)) {
     io_ = av::NewIo(
         kBufferSize, mode == Mode::kWrite, this,
         [](void* self, uint8_t* data, int size) { return static_cast<AvioFile*>(self)->Read(data, size); },
@@ -38,6 +38,8 @@ int AvioFile::Write(const uint8_t* data, int size) {
     while (error_ == 0 && done < size) {
         const int64_t written = file_->Write(data + done, size - done);
         if (written > 0) {
+            if (tap_)
+                error_ = tap_(position_, data + done, written);
             done += static_cast<int>(written);
             position_ += written;
             size_.store(std::max(size_.load(std::memory_order_relaxed), position_),

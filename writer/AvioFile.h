@@ -18,10 +18,13 @@ public:
     /// Asked when the disk is full, with the bytes that it has not taken; true: try again.
     using FullDiskHandler = std::function<bool(int64_t)>;
 
+    /// Told what was written, and where; 0, or an errno value.
+    using Tap = std::function<int(int64_t position, const uint8_t* data, int64_t size)>;
+
     enum class Mode { kRead, kWrite };
 
     /// Throws std::bad_alloc.
-    AvioFile(std::shared_ptr<ByteFile> file, Mode mode, FullDiskHandler onFull = {});
+    AvioFile(std::shared_ptr<ByteFile> file, Mode mode, FullDiskHandler onFull = {}, Tap tap = {});
     AvioFile(const AvioFile&) = delete;
     AvioFile& operator=(const AvioFile&) = delete;
     ~AvioFile() = default;
@@ -45,6 +48,7 @@ private:
 
     const std::shared_ptr<ByteFile> file_;
     const FullDiskHandler onFull_;
+    const Tap tap_;
     av::Io io_;
     int error_ = 0;
     int64_t position_ = 0;

@@ -1,7 +1,6 @@
 #include "writer/FileFinisher.h"
 
 #include "platform/LogRoute.h"
-#include "writer/AvioFile.h"
 #include "writer/Fragments.h"
 #include "writer/WriterFailure.h"
 #include "writer/WriterStatus.h"
@@ -9,14 +8,13 @@
 #include <algorithm>
 #include <cstring>
 #include <exception>
-#include <utility>
 
 namespace writer {
 namespace {
 
-/// Shares of the finishing work that precede and follow the copy of the data.
+/// Shares of the finishing work that precede and follow the index.
 constexpr double kDrainedShare = 0.3;
-constexpr double kCopiedShare = 0.9;
+constexpr double kIndexedShare = 0.9;
 
 /// Finishing is told in steps of at least this share.
 constexpr double kTellStep = 0.02;
@@ -29,9 +27,8 @@ void FileFinisher::Finish() {
     part_.WriteTrailer();
     TellLengths();
     if (plan_.Fragmented())
-        FinishFragments();
-    else
-        Publish(part_.Path(), *part_.File());
+        FinishInPlace();
+    Publish();
 }
 
 void FileFinisher::TellLengths() {
@@ -51,49 +48,32 @@ void FileFinisher::TellLengths() {
     });
 }
 
-/// Gives the data its final form in a second file. The fragmented one is a whole movie too: it takes the name
-/// when there is no room for both.
-void FileFinisher::FinishFragments() {
-    int error = 0;
-    std::string path;
-    std::unique_ptr<ByteFile> file = CreateBeside(files_, target_, ".joined.part", path, error);
-    if (file) {
-        try {
-            JoinInto(path, std::move(file));
-            files_.Remove(part_.Path());
-            return;
-        } catch (...) {
-            files_.Remove(path);
-            const WriterFailure failure = FailureOf(std::current_exception());
-            if (failure.Kind() == kWriterErrorFinish)
-                throw;
-            WriteLog(kLogWarning, "Keeping the fragmented form of \"%s\": %s", target_.c_str(),
-                     failure.what());
-        }
+/// The fragmented file is a whole movie too: it takes the name when there is no room or memory for the index.
+void FileFinisher::FinishInPlace() {
+    try {
+        FinishFragments(part_.File(), part_.Streams(), *plan_.container, part_.Fragments(), *part_.Room(),
+                        plan_.bitExact, extras_, [this](double share) {
+                            Progress(kDrainedShare + (kIndexedShare - kDrainedShare) * share);
+                        });
+    } catch (...) {
+        const WriterFailure failure = FailureOf(std::current_exception());
+        if (failure.Kind() == kWriterErrorFinish)
+            throw;
+        WriteLog(kLogWarning, "Keeping the fragmented form of \"%s\": %s", target_.c_str(), failure.what());
     }
-    Publish(part_.Path(), *part_.File());
-}
-
-void FileFinisher::JoinInto(const std::string& path, const std::shared_ptr<ByteFile>& file) {
-    AvioFile out(file, AvioFile::Mode::kWrite);
-    JoinFragments(part_.File(), part_.Streams(), *plan_.container, out, plan_.bitExact, extras_,
-                  [this](double share) { Progress(kDrainedShare + (kCopiedShare - kDrainedShare) * share); });
-    if (const int error = out.Flush(); error != 0)
-        throw SystemFailure(kWriterErrorWrite, error, "Writing to \"%s\" failed", path.c_str());
-    CheckIndex(file, part_.Streams());
-    Publish(path, *file);
-    record_.Update([&out](WriterStatus& status) { status.llBytesWritten = out.Size(); });
+    const int64_t size = part_.File()->Seek(0, SEEK_END);
+    record_.Update([size](WriterStatus& status) { status.llBytesWritten = size; });
 }
 
 /// Syncs the file and gives it the target's name.
-void FileFinisher::Publish(const std::string& path, ByteFile& file) {
-    Progress(kCopiedShare);
-    if (const int64_t result = file.Sync(); result < 0)
+void FileFinisher::Publish() {
+    Progress(kIndexedShare);
+    if (const int64_t result = part_.File()->Sync(); result < 0)
         throw SystemFailure(kWriterErrorFinish, static_cast<int>(-result), "Syncing \"%s\" failed",
-                            path.c_str());
+                            part_.Path().c_str());
     const bool replace = record_.Options().bKeepExisting == 0;
-    if (const int error = files_.Rename(path, target_, replace); error != 0)
-        throw SystemFailure(kWriterErrorFinish, error, "Renaming \"%s\" failed", path.c_str());
+    if (const int error = files_.Rename(part_.Path(), target_, replace); error != 0)
+        throw SystemFailure(kWriterErrorFinish, error, "Renaming \"%s\" failed", part_.Path().c_str());
     record_.SetTemporaryPath("");
     if (const int error = files_.SyncFolder(target_); error != 0)
         WriteLog(kLogWarning, "Syncing the folder of \"%s\" failed: %s.", target_.c_str(),

@@ -8,7 +8,6 @@
 #include "writer/FileSystem.h"
 #include "writer/PartFile.h"
 
-#include <memory>
 #include <string>
 #include <utility>
 
@@ -31,9 +30,8 @@ public:
     void Abandon();
 
 private:
-    void FinishFragments();
-    void JoinInto(const std::string& path, const std::shared_ptr<ByteFile>& file);
-    void Publish(const std::string& path, ByteFile& file);
+    void FinishInPlace();
+    void Publish();
     void TellLengths();
     void Progress(double share);
 

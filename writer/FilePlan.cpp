@@ -138,6 +138,32 @@ SoundPlan MakeSoundPlan(const EncodeParam& param, const AudioFormat& source, con
     return plan;
 }
 
+/// Bytes that the index of a plain file of the MP4 family takes when the movie is as long as its source; too
+/// few when it gets longer.
+int64_t IndexSize(const FilePlan& plan, const VideoFormat* video, const AudioFormat* audio) {
+    constexpr double kFixed = 4096;
+    constexpr double kPerPicture = 14;        // size, shift and a run of equal lengths
+    constexpr double kPerUnevenPicture = 22;  // and lengths of their own
+    constexpr double kPerPacket = 5;          // of sound
+    constexpr double kPerSecond = 60;         // chunks of both, key pictures
+    constexpr double kSamplesPerPacket = 960; // the least of the usual ones
+    constexpr double kUnknown = 60;           // seconds
+    constexpr double kMost = 1e9;
+    double length = 0;
+    double perSecond = kPerSecond;
+    if (plan.pictures) {
+        length = video->dDuration;
+        perSecond += (plan.pictures->keepStamps ? kPerUnevenPicture : kPerPicture) *
+                     std::max(av_q2d(plan.pictures->clock.rate), video->dFrameRate);
+    }
+    if (plan.sound) {
+        length = std::max(length, audio->dDuration);
+        perSecond += kPerPacket * plan.sound->settings.sampleRate / kSamplesPerPacket;
+    }
+    const double size = (length > 0 ? length : kUnknown) * perSecond;
+    return static_cast<int64_t>(kFixed + (size < kMost ? size : kMost));
+}
+
 } // namespace
 
 FilePlan MakeFilePlan(const EncodeParam& param, const VideoFormat* video, const AudioFormat* audio,
@@ -154,6 +180,7 @@ FilePlan MakeFilePlan(const EncodeParam& param, const VideoFormat* video, const 
         throw WriterFailure(kWriterErrorArgument,
                             "There is nothing to write into a file of the format " + FormatText(param) + ".");
     plan.bitExact = options.bBitExact != 0;
+    plan.indexSize = IndexSize(plan, video, audio);
     return plan;
 }
 

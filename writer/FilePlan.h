@@ -42,6 +42,8 @@ struct FilePlan {
     std::optional<PicturePlan> pictures;
     std::optional<SoundPlan> sound;
     bool bitExact;
+    /// Bytes that the index of a file of the MP4 family takes when it is as long as its source.
+    int64_t indexSize;
 
     /// Whether the file grows in fragments and gets one index when it is finished.
     bool Fragmented() const { return container->kind == ContainerKind::kFragmented; }

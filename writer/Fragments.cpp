@@ -14,15 +14,15 @@
 namespace writer {
 namespace {
 
-/// Throws WriterFailure of that kind.
-av::Input OpenMovie(AvioFile& file, int kind) {
+/// Throws WriterFailure of that kind. `flags` are more of the demultiplexer's.
+av::Input OpenMovie(AvioFile& file, int kind, int flags = 0) {
     av::Options options;
     options.Set("ignore_editlist", "1");
     AVFormatContext* context = avformat_alloc_context();
     if (context == nullptr)
         throw std::bad_alloc();
     context->pb = file.Io();
-    context->flags |= AVFMT_FLAG_NOFILLIN | AVFMT_FLAG_NOPARSE;
+    context->flags |= AVFMT_FLAG_NOFILLIN | AVFMT_FLAG_NOPARSE | flags;
     const int error = avformat_open_input(&context, nullptr, av_find_input_format("mov"), options.Get());
     av::Input input(context);
     av::CheckMemory(error);
@@ -31,86 +31,77 @@ av::Input OpenMovie(AvioFile& file, int kind) {
     return input;
 }
 
-/// Gives `joined` the streams of `written`. The packets of these codecs have been brought into the
+/// Gives `index` the streams of `written`. The packets of these codecs have been brought into the
 /// container's own form, to which the description in the file belongs and the encoder's does not.
-void AddStreams(const AVFormatContext& input, const Muxer& written, Muxer& joined) {
+void AddStreams(const AVFormatContext& input, const Muxer& written, Mp4Index& index) {
     for (int stream = 0; stream < written.StreamCount(); ++stream) {
-        MuxedStream description = written.Stream(stream).description;
+        const Muxer::Written taken = written.Stream(stream);
+        MuxedStream description = taken.description;
         const AVCodecParameters* stored = input.streams[stream]->codecpar;
         const bool reformed = stored->codec_id == AV_CODEC_ID_H264 || stored->codec_id == AV_CODEC_ID_HEVC;
         if (reformed)
             description.parameters = stored;
-        joined.AddStream(description);
+        index.AddStream(description, taken.delay);
     }
+}
+
+/// Whether all of it could be read.
+bool ReadAll(ByteFile& file, int64_t position, uint8_t* data, int64_t size) {
+    if (file.Seek(position, SEEK_SET) < 0)
+        return false;
+    while (size > 0) {
+        const int64_t got = file.Read(data, size);
+        if (got <= 0)
+            return false;
+        data += got;
+        size -= got;
+    }
+    return true;
 }
 
 struct Box {
     std::array<char, 4> type;
-    int64_t size; ///< With its header, below 2^32; 0 when the header is not whole or makes no sense.
+    int64_t size; ///< With its header; 0 when the header is not whole or makes no sense.
 };
 
+int64_t Number(const uint8_t* bytes, int size) {
+    return std::accumulate(bytes, bytes + size, int64_t{0},
+                           [](int64_t value, uint8_t byte) { return value << 8 | byte; });
+}
+
 Box ReadBox(ByteFile& file, int64_t position) {
-    std::array<uint8_t, 8> header{};
-    size_t count = 0;
-    if (file.Seek(position, SEEK_SET) < 0)
+    std::array<uint8_t, 16> header{};
+    int64_t headerSize = 8;
+    if (!ReadAll(file, position, header.data(), headerSize))
         return {};
-    while (count < header.size()) {
-        const int64_t got = file.Read(&header[count], static_cast<int64_t>(header.size() - count));
-        if (got <= 0)
-            break;
-        count += static_cast<size_t>(got);
-    }
-    if (count < header.size())
-        return {};
-    Box box{{}, std::accumulate(&header[0], &header[4], int64_t{0}, [](int64_t value, uint8_t byte) {
-                return value << 8 | byte;
-            })};
+    Box box{{}, Number(header.data(), 4)};
     std::memcpy(box.type.data(), &header[4], box.type.size());
-    return box.size < static_cast<int64_t>(header.size()) ? Box{} : box;
+    if (box.size == 1) {
+        headerSize = 16;
+        if (!ReadAll(file, position + 8, &header[8], 8))
+            return {};
+        box.size = Number(&header[8], 8);
+    }
+    return box.size < headerSize ? Box{} : box;
 }
 
 [[noreturn]] void ThrowIncomplete() {
     throw WriterFailure(kWriterErrorFinish, "The temporary file does not hold all that was written.");
 }
 
-} // namespace
-
-void JoinFragments(const std::shared_ptr<ByteFile>& part, const Muxer& written, const Container& container,
-                   AvioFile& out, bool bitExact, const Extras& extras,
-                   const std::function<void(double)>& progress) {
-    const int64_t end = part->Seek(0, SEEK_END);
-    if (WholeFragments(*part, end) != end)
+/// The beginning of a packet's content, as much as its index could depend on.
+std::vector<uint8_t> ReadStart(ByteFile& file, const PlacedPacket& packet) {
+    constexpr int64_t kMost = 4096;
+    std::vector<uint8_t> start(static_cast<size_t>(std::min(packet.size, kMost)));
+    if (!ReadAll(file, packet.position, start.data(), static_cast<int64_t>(start.size())))
         ThrowIncomplete();
-    AvioFile file(part, AvioFile::Mode::kRead);
-    const av::Input input = OpenMovie(file, kWriterErrorFinish);
-    if (static_cast<int>(input->nb_streams) != written.StreamCount())
-        ThrowIncomplete();
-    Muxer joined(container, out, false, bitExact, extras);
-    AddStreams(*input, written, joined);
-    joined.SetChapters(extras.chapters);
-    joined.WriteHeader();
-    const av::Packet packet = av::NewPacket();
-    const auto size = static_cast<double>(std::max<int64_t>(1, file.Size()));
-    int error = 0;
-    while ((error = av_read_frame(input.get(), packet.get())) >= 0) {
-        const int64_t delay = written.Stream(packet->stream_index).delay;
-        packet->dts -= delay;
-        packet->pts -= delay;
-        progress(static_cast<double>(packet->pos) / size);
-        joined.Write(*packet, packet->stream_index);
-    }
-    av::CheckMemory(error);
-    if (error != AVERROR_EOF)
-        throw WriterFailure(kWriterErrorFinish,
-                            "The temporary file cannot be read: " + av::ErrorText(error) + ".", file.Error());
-    for (int stream = 0; stream < written.StreamCount(); ++stream)
-        if (joined.Stream(stream).packets != written.Stream(stream).packets)
-            ThrowIncomplete();
-    joined.WriteTrailer();
+    return start;
 }
 
-void CheckIndex(const std::shared_ptr<ByteFile>& file, const Muxer& written) {
-    AvioFile in(file, AvioFile::Mode::kRead);
+/// Throws WriterFailure when the index of `file` does not name all that `written` took: the multiplexer
+/// leaves out without a word what it has no memory for.
+void CheckIndex(ByteFile& file, const Muxer& written) {
+    AvioFile in(std::shared_ptr<ByteFile>(std::shared_ptr<ByteFile>(), &file), AvioFile::Mode::kRead);
     const av::Input input = OpenMovie(in, kWriterErrorEncode);
     for (int stream = 0; stream < written.StreamCount(); ++stream) {
         // Sound that is not compressed is counted in samples.
@@ -118,6 +109,37 @@ void CheckIndex(const std::shared_ptr<ByteFile>& file, const Muxer& written) {
             input->streams[stream]->nb_frames < written.Stream(stream).packets)
             throw WriterFailure(kWriterErrorEncode, "The index is not whole.");
     }
+}
+
+} // namespace
+
+void FinishFragments(const std::shared_ptr<ByteFile>& part, const Muxer& written, const Container& container,
+                     const FragmentLog& log, const Mp4Room& room, bool bitExact, const Extras& extras,
+                     const std::function<void(double)>& progress) {
+    // The multiplexer does not tell of data that it had no memory for.
+    const int64_t end = part->Seek(0, SEEK_END);
+    if (log.End() != end)
+        ThrowIncomplete();
+    AvioFile file(part, AvioFile::Mode::kRead);
+    const av::Input input = OpenMovie(file, kWriterErrorFinish, AVFMT_FLAG_IGNIDX);
+    if (static_cast<int>(input->nb_streams) != written.StreamCount())
+        ThrowIncomplete();
+    const auto makeIndex = [&](int64_t place) {
+        Mp4Index index(container, bitExact, extras);
+        AddStreams(*input, written, index);
+        log.ForEach([&](const PlacedPacket& packet) {
+            if (packet.position + packet.size > end)
+                ThrowIncomplete();
+            progress(static_cast<double>(packet.position) / static_cast<double>(end));
+            index.Add(packet, index.WantsContent(packet) ? ReadStart(*part, packet) : std::vector<uint8_t>{});
+        });
+        for (int stream = 0; stream < written.StreamCount(); ++stream)
+            if (index.Packets(stream) != written.Stream(stream).packets)
+                ThrowIncomplete();
+        return index.Finish(place);
+    };
+    room.Finish(*part, makeIndex, Mp4Index::MostTexts(extras),
+                [&written](ByteFile& plain) { CheckIndex(plain, written); });
 }
 
 int64_t WholeFragments(ByteFile& part, int64_t size) {

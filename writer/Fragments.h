@@ -2,7 +2,8 @@
 #ifndef MOVIECONV_WRITER_FRAGMENTS_H
 #define MOVIECONV_WRITER_FRAGMENTS_H
 
-#include "writer/AvioFile.h"
+#include "writer/FragmentLog.h"
+#include "writer/Mp4Room.h"
 #include "writer/Muxer.h"
 
 #include <functional>
@@ -10,17 +11,14 @@
 
 namespace writer {
 
-/// Writes the movie in the fragmented file `part`, written by `written`, into `out` once more with a single
-/// index, with `extras`, whose chapters are on the file's timeline. Times are
-/// those that went into `written`. `progress` is told the share done, 0 to 1. Throws
-/// WriterFailure, with kWriterErrorFinish when `part` cannot be read or does not hold all that was written.
-void JoinFragments(const std::shared_ptr<ByteFile>& part, const Muxer& written, const Container& container,
-                   AvioFile& out, bool bitExact, const Extras& extras,
-                   const std::function<void(double)>& progress);
-
-/// Throws WriterFailure when the index of `file` does not name all that `written` took: the multiplexer
-/// leaves out without a word what it has no memory for.
-void CheckIndex(const std::shared_ptr<ByteFile>& file, const Muxer& written);
+/// Gives the fragmented file `part`, written by `written`, one index in `room`, over data that stays where it
+/// is. `log` has seen all of it. The chapters of `extras` are on the file's timeline. Times are then those
+/// that went into `written`. The file has to be synced afterwards. `progress` is told the share done, 0 to 1.
+/// Throws WriterFailure, with kWriterErrorFinish when `part` cannot be read or does not hold all that was
+/// written; it is the fragmented file then, as it was.
+void FinishFragments(const std::shared_ptr<ByteFile>& part, const Muxer& written, const Container& container,
+                     const FragmentLog& log, const Mp4Room& room, bool bitExact, const Extras& extras,
+                     const std::function<void(double)>& progress);
 
 /// How far `part`, which has `size` bytes, consists of whole fragments. The multiplexer does not know: of
 /// data that it had no memory for it does not tell.

@@ -49,7 +49,7 @@ void SetTags(AVDictionary*& metadata, const Tags& tags) {
         av::CheckMemory(av_dict_set(&metadata, key.c_str(), value.c_str(), 0));
 }
 
-void SetFragments(AVFormatContext& output, bool describedByPacket) {
+void SetFragments(AVFormatContext& output, bool describedByPacket, int64_t room) {
     // Times are written as they are, from the first fragment on.
     std::string flags = "empty_moov+default_base_moof+frag_discont";
     SetOption(output, "use_editlist", "0");
@@ -63,6 +63,7 @@ void SetFragments(AVFormatContext& output, bool describedByPacket) {
     if (describedByPacket)
         flags += "+delay_moov";
     SetOption(output, "movflags", flags);
+    SetOption(output, "moov_size", std::to_string(room));
 }
 
 } // namespace
@@ -100,8 +101,8 @@ int Muxer::AddStream(const MuxedStream& stream) {
     return made->index;
 }
 
-void Muxer::WriteHeader() {
-    SetOptions();
+void Muxer::WriteHeader(int64_t room) {
+    SetOptions(room);
     if (Carries(kWriterFormatAttachments))
         AddAttachments();
     if (Carries(kWriterFormatCover) && !fragmented_)
@@ -114,13 +115,14 @@ void Muxer::WriteHeader() {
 }
 
 /// One by one: avformat_write_header ignores it when it has no memory for one.
-void Muxer::SetOptions() {
+void Muxer::SetOptions(int64_t room) {
     if (container_.options != nullptr)
         av::CheckMemory(av_set_options_string(output_->priv_data, container_.options, "=", ","));
     if (fragmented_) {
-        SetFragments(*output_, std::any_of(streams_.begin(), streams_.end(), [](const State& stream) {
+        const bool describedByPacket = std::any_of(streams_.begin(), streams_.end(), [](const State& stream) {
             return stream.carriage->describedByPacket;
-        }));
+        });
+        SetFragments(*output_, describedByPacket, room);
     } else if (container_.kind == ContainerKind::kSteadyRate) {
         SetOption(*output_, "avoid_negative_ts",
                   "disabled"); // Moving pictures by less than one would lose one.
@@ -250,6 +252,14 @@ void Muxer::Write(AVPacket& packet, int stream) {
     ++state.packets;
     NoteWhole();
     FlushNowAndThen(time);
+}
+
+void Muxer::WriteAt(AVPacket& packet, int64_t position) {
+    output_->flags &= ~AVFMT_FLAG_AUTO_BSF; // it has been through that
+    if (avio_tell(output_->pb) != position)
+        avio_seek(output_->pb, position, SEEK_SET);
+    Check(av_write_frame(output_.get(), &packet), "refuses a packet");
+    ++streams_[static_cast<size_t>(packet.stream_index)].packets;
 }
 
 /// What begins before the first packet of the file is refused by some.

@@ -38,13 +38,21 @@ public:
     /// Returns the stream's number, from 0 on. A fragmented file cannot express times below 0: all its times
     /// are later by the longest run-up.
     int AddStream(const MuxedStream& stream);
-    void WriteHeader();
+
+    /// `room`: bytes that stay free in front of a fragmented file's description; before all of it where that
+    /// has to wait for the first packets.
+    void WriteHeader(int64_t room = 0);
 
     /// Chapters on the file's timeline, before its end; where it is fragmented, it takes none.
     void SetChapters(const std::vector<Chapter>& chapters);
 
     /// Takes the packet's content. Times are in the stream's unit; those of decoding must not fall.
     void Write(AVPacket& packet, int stream);
+
+    /// Names a packet that lies at `position` of the file already, in the form that the container gives it:
+    /// its times are in the unit that Stream tells, and its content is written there once more. For one
+    /// thread.
+    void WriteAt(AVPacket& packet, int64_t position);
 
     /// The end of the file; a second call does nothing.
     void WriteTrailer();
@@ -88,7 +96,7 @@ private:
 
     static void NoteTimes(State& state, const AVPacket& packet);
     void Check(int result, const char* what) const;
-    void SetOptions();
+    void SetOptions(int64_t room);
     bool Carries(uint32_t what) const { return (container_.carries & what) != 0; }
     void AddAttachments();
     void AddCover();

@@ -19,9 +19,17 @@ PartFile::PartFile(const std::string& target, const FilePlan& plan, std::shared_
         throw SystemFailure(kWriterErrorOpen, error, "No file can be created in the folder \"%s\"",
                             text::FolderOf(target).c_str());
     try {
-        io_ = std::make_unique<AvioFile>(std::move(file), AvioFile::Mode::kWrite, [this](int64_t waiting) {
-            return record_->AskAboutFullDisk(waiting);
-        });
+        AvioFile::Tap tap;
+        if (plan.Fragmented()) {
+            room_.emplace(RoomFor(plan.indexSize + Mp4Index::MostOf(*record_->ExtraParts())));
+            tap = [this, made = file.get()](int64_t position, const uint8_t* data, int64_t size) {
+                fragments_.Take(position, data, size);
+                return room_->Close(*made);
+            };
+        }
+        io_ = std::make_unique<AvioFile>(
+            std::move(file), AvioFile::Mode::kWrite,
+            [this](int64_t waiting) { return record_->AskAboutFullDisk(waiting); }, std::move(tap));
         muxer_ = std::make_unique<Muxer>(*plan.container, *io_, plan.Fragmented(), plan.bitExact,
                                          *record_->ExtraParts());
     } catch (...) {
@@ -31,7 +39,7 @@ PartFile::PartFile(const std::string& target, const FilePlan& plan, std::shared_
 }
 
 void PartFile::WriteHeader() {
-    muxer_->WriteHeader();
+    muxer_->WriteHeader(room_ ? room_->Size() : 0);
     if (io_->Flush() != 0)
         throw WriterFailure(kWriterErrorWrite, "");
     TellSize();

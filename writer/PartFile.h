@@ -6,10 +6,13 @@
 #include "writer/FilePlan.h"
 #include "writer/FileRecord.h"
 #include "writer/FileSystem.h"
+#include "writer/FragmentLog.h"
+#include "writer/Mp4Room.h"
 #include "writer/Muxer.h"
 
 #include <exception>
 #include <memory>
+#include <optional>
 #include <string>
 
 namespace writer {
@@ -52,6 +55,10 @@ public:
     /// made of it. Allocates nothing.
     WriterFailure Explain(const std::exception_ptr& error) const noexcept;
 
+    /// Room for the index of a fragmented file; else null.
+    const Mp4Room* Room() const { return room_ ? &*room_ : nullptr; }
+    const FragmentLog& Fragments() const { return fragments_; }
+
     const std::string& Path() const { return path_; }
     const std::shared_ptr<ByteFile>& File() const { return io_->File(); }
     bool Broken() const { return io_->Error() != 0; }
@@ -61,6 +68,8 @@ private:
     const std::shared_ptr<FileRecord> record_;
     FileSystem& files_;
     std::string path_;
+    std::optional<Mp4Room> room_;
+    FragmentLog fragments_;
     std::unique_ptr<AvioFile> io_;
     std::unique_ptr<Muxer> muxer_;
 };

@@ -130,9 +130,9 @@ bool IsOutput(const std::string& path, const Request& request) {
     if (!AreSame(text::FolderOf(path), text::FolderOf(request.output)))
         return false;
     std::string name = NameOf(path);
-    for (const std::string_view suffix : {".joined.part", ".part"})
-        if (name.size() > suffix.size() && name.ends_with(suffix))
-            name.resize(name.size() - suffix.size());
+    constexpr std::string_view kSuffix = ".part";
+    if (name.size() > kSuffix.size() && name.ends_with(kSuffix))
+        name.resize(name.size() - kSuffix.size());
     const std::string output = NameOf(request.output);
     const auto [base, extension] = SplitName(output);
     return name == output || (request.split && IsClipName(name, base, extension));

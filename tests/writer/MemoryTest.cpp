@@ -132,17 +132,6 @@ private:
     bool failed_ = false;
 };
 
-void ExpectSame(const ReadMovie& movie, const ReadMovie& whole) {
-    EXPECT_TRUE(movie.readable);
-    ASSERT_EQ(movie.pictures.size(), whole.pictures.size());
-    for (size_t i = 0; i < movie.pictures.size(); ++i)
-        EXPECT_TRUE(movie.pictures[i].luma == whole.pictures[i].luma) << "picture " << i;
-    // Without its index, the sound of an MP4 file has its codec's run-up before it.
-    const auto& sound = movie.firstChannel;
-    EXPECT_NE(std::search(sound.begin(), sound.end(), whole.firstChannel.begin(), whole.firstChannel.end()),
-              sound.end());
-}
-
 /// The child's life.
 int Attempt(const Case& what, int64_t number, const ReadMovie& whole) {
     alarm(120);

@@ -110,6 +110,37 @@ ReadMovie ReadMovieFile(const std::string& path) {
     return movie;
 }
 
+void ExpectSame(const ReadMovie& movie, const ReadMovie& whole) {
+    EXPECT_TRUE(movie.readable);
+    ASSERT_EQ(movie.pictures.size(), whole.pictures.size());
+    for (size_t i = 0; i < movie.pictures.size(); ++i)
+        EXPECT_TRUE(movie.pictures[i].luma == whole.pictures[i].luma) << "picture " << i;
+    const auto& sound = movie.firstChannel;
+    EXPECT_NE(std::search(sound.begin(), sound.end(), whole.firstChannel.begin(), whole.firstChannel.end()),
+              sound.end());
+}
+
+void ReadPackets(const std::string& path, const std::function<void(const AVPacket&)>& take) {
+    AVFormatContext* context = avformat_alloc_context();
+    context->flags |= AVFMT_FLAG_NOFILLIN | AVFMT_FLAG_NOPARSE;
+    ASSERT_EQ(avformat_open_input(&context, ("file:" + path).c_str(), nullptr, nullptr), 0);
+    const av::Input input(context);
+    const av::Packet packet = av::NewPacket();
+    while (av_read_frame(context, packet.get()) >= 0) {
+        take(*packet);
+        av_packet_unref(packet.get());
+    }
+}
+
+void WithStreams(const std::string& path, const std::function<void(const AVStream&)>& take) {
+    AVFormatContext* context = nullptr;
+    ASSERT_EQ(avformat_open_input(&context, ("file:" + path).c_str(), nullptr, nullptr), 0);
+    const av::Input input(context);
+    ASSERT_GE(avformat_find_stream_info(context, nullptr), 0);
+    for (unsigned i = 0; i < context->nb_streams; ++i)
+        take(*context->streams[i]);
+}
+
 double ReadMovie::ToneBegins() const {
     const auto loud = std::find_if(firstChannel.begin(), firstChannel.end(),
                                    [](float sample) { return std::abs(sample) > 0.2F; });

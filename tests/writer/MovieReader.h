@@ -47,6 +47,14 @@ struct ReadMovie {
 /// errors.
 ReadMovie ReadMovieFile(const std::string& path);
 
+/// Fails the test when `movie` is not `whole`. It may have its codec's run-up before its sound, as files of
+/// the MP4 family have without their index.
+void ExpectSame(const ReadMovie& movie, const ReadMovie& whole);
+
+/// Calls `take` for every packet of a file, in its order and unchanged, or for every stream.
+void ReadPackets(const std::string& path, const std::function<void(const AVPacket&)>& take);
+void WithStreams(const std::string& path, const std::function<void(const AVStream&)>& take);
+
 /// Writes a file with everything in `movie`, or with what `write` writes, and reads it. Fails the test when
 /// the writer does not say that the file is complete.
 ReadMovie WriteAndRead(const TestMovie& movie, const std::function<void(void* file)>& write = nullptr);

@@ -1,0 +1,170 @@
+#include "writer/Mp4Index.h"
+
+#include "writer/WriterFailure.h"
+#include "writer/WriterStatus.h"
+
+#include <algorithm>
+#include <array>
+#include <cerrno>
+#include <cstdio>
+#include <cstring>
+#include <new>
+#include <numeric>
+#include <utility>
+
+namespace writer {
+namespace {
+
+/// Where the index begins in what was kept: behind the texts, which are packets and no boxes.
+size_t FindMoov(const std::vector<uint8_t>& kept) {
+    // The index ends what was kept, and its first four bytes say how long it is.
+    constexpr std::array<uint8_t, 4> kName{'m', 'o', 'o', 'v'};
+    for (auto at = kept.begin(); (at = std::search(at, kept.end(), kName.begin(), kName.end())) != kept.end();
+         ++at) {
+        const auto name = static_cast<size_t>(at - kept.begin());
+        if (name < 4)
+            continue;
+        const size_t begin = name - 4;
+        const size_t size = size_t{kept[begin]} << 24 | size_t{kept[begin + 1]} << 16 |
+                            size_t{kept[begin + 2]} << 8 | size_t{kept[begin + 3]};
+        if (begin + size == kept.size())
+            return begin;
+    }
+    throw WriterFailure(kWriterErrorEncode, "The container has no index.");
+}
+
+} // namespace
+
+/// Drops what is written to it, but for the end.
+class Mp4Index::Sink final : public ByteFile {
+public:
+    /// What is written from `place` on is kept.
+    void KeepFrom(int64_t place) { place_ = place; }
+    std::vector<uint8_t>& Kept() { return kept_; }
+
+    int64_t Write(const uint8_t* data, int64_t size) override {
+        const int64_t begin = position_;
+        position_ += size;
+        end_ = std::max(end_, position_);
+        if (place_ < 0 || begin < place_)
+            return size;
+        const auto at = static_cast<size_t>(begin - place_);
+        try {
+            kept_.resize(std::max(kept_.size(), at + static_cast<size_t>(size)));
+        } catch (...) {
+            return -ENOMEM;
+        }
+        std::memcpy(&kept_[at], data, static_cast<size_t>(size));
+        return size;
+    }
+    int64_t Read(uint8_t* /*data*/, int64_t /*size*/) override { return 0; }
+    int64_t Seek(int64_t offset, int whence) override {
+        position_ = offset + (whence == SEEK_SET ? 0 : whence == SEEK_CUR ? position_ : end_);
+        return position_;
+    }
+    int64_t Truncate(int64_t /*size*/) override { return -EBADF; }
+    int64_t Sync() override { return 0; }
+
+private:
+    int64_t position_ = 0;
+    int64_t end_ = 0;
+    int64_t place_ = -1;
+    std::vector<uint8_t> kept_;
+};
+
+Mp4Index::Mp4Index(const Container& container, bool bitExact, const Extras& extras)
+    : extras_(extras),
+      sink_(std::make_shared<Sink>()),
+      file_(sink_, AvioFile::Mode::kWrite),
+      muxer_(container, file_, false, bitExact, extras),
+      packet_(av::NewPacket()) {
+    file_.Io()->direct = 1; // what stands in for the data need not be copied
+}
+
+Mp4Index::~Mp4Index() = default;
+
+int64_t Mp4Index::MostTexts(const Extras& extras) {
+    constexpr int64_t kPerText = 64;
+    return std::accumulate(extras.chapters.begin(), extras.chapters.end(), int64_t{0},
+                           [](int64_t sum, const Chapter& chapter) {
+                               return sum + kPerText + static_cast<int64_t>(chapter.title.size());
+                           });
+}
+
+int64_t Mp4Index::MostOf(const Extras& extras) {
+    constexpr int64_t kPerTag = 64;
+    constexpr int64_t kChapterTrack = 2048;
+    // In the texts, in the list, and in the tables of their track.
+    int64_t size = 3 * MostTexts(extras) + (extras.chapters.empty() ? 0 : kChapterTrack);
+    for (const Tags* tags : {&extras.tags, &extras.pictureTags, &extras.soundTags})
+        for (const auto& [key, value] : *tags)
+            size += kPerTag + static_cast<int64_t>(key.size() + value.size());
+    return size + (extras.cover.data ? kPerTag + static_cast<int64_t>(extras.cover.data->size()) : 0);
+}
+
+void Mp4Index::AddStream(const MuxedStream& stream, int64_t delay) {
+    muxer_.AddStream(stream);
+    streams_.push_back(
+        {stream.unit, delay, stream.parameters->codec_id, stream.carriage->describedByPacket, {}});
+}
+
+void Mp4Index::Begin() {
+    if (std::exchange(begun_, true))
+        return;
+    muxer_.WriteHeader();
+    for (size_t stream = 0; stream < streams_.size(); ++stream)
+        streams_[stream].muxedUnit = muxer_.Stream(static_cast<int>(stream)).description.unit;
+}
+
+bool Mp4Index::WantsContent(const PlacedPacket& packet) const {
+    const auto stream = static_cast<size_t>(packet.stream);
+    // The first packet of some codecs describes all of them; pictures of this one are told apart in the
+    // index.
+    return stream < streams_.size() && (streams_[stream].packets == 0 ||
+                                        (packet.key && streams_[stream].codec == AV_CODEC_ID_MPEG2VIDEO));
+}
+
+void Mp4Index::Add(const PlacedPacket& placed, const std::vector<uint8_t>& content) {
+    Begin();
+    if (placed.stream < 0 || static_cast<size_t>(placed.stream) >= streams_.size())
+        throw WriterFailure(kWriterErrorFinish, "The temporary file holds a stream that was not written.");
+    Stream& stream = streams_[static_cast<size_t>(placed.stream)];
+    const auto size = static_cast<size_t>(placed.size);
+    if (content_.size() < size + AV_INPUT_BUFFER_PADDING_SIZE)
+        content_.resize(size + AV_INPUT_BUFFER_PADDING_SIZE);
+    if (stream.packets == 0 && stream.describedByPacket)
+        stream.start = content;
+    const std::vector<uint8_t>& shown = content.empty() ? stream.start : content;
+    std::copy_n(shown.begin(), std::min(shown.size(), size), content_.begin());
+    packet_->data = content_.data();
+    packet_->size = static_cast<int>(placed.size);
+    packet_->stream_index = placed.stream;
+    packet_->dts = placed.dts - stream.delay;
+    packet_->pts = placed.pts - stream.delay;
+    packet_->duration = placed.duration;
+    packet_->flags = placed.key ? AV_PKT_FLAG_KEY : 0;
+    av_packet_rescale_ts(packet_.get(), stream.unit, stream.muxedUnit);
+    muxer_.WriteAt(*packet_, placed.position);
+    std::fill_n(content_.begin(), std::min(shown.size(), size), uint8_t{0});
+    ++stream.packets;
+}
+
+Mp4Index::Result Mp4Index::Finish(int64_t place) {
+    Begin();
+    file_.Flush();
+    avio_seek(file_.Io(), place, SEEK_SET);
+    sink_->KeepFrom(place);
+    // Only now, so that their texts come here.
+    muxer_.SetChapters(extras_.chapters);
+    muxer_.WriteTrailer();
+    if (file_.Flush() != 0)
+        throw std::bad_alloc();
+    std::vector<uint8_t>& kept = sink_->Kept();
+    const size_t moov = FindMoov(kept);
+    Result result{{}, std::vector<uint8_t>(kept.begin() + static_cast<std::ptrdiff_t>(moov), kept.end())};
+    kept.resize(moov);
+    result.texts = std::move(kept);
+    return result;
+}
+
+} // namespace writer
