@@ -1,6 +1,7 @@
 #include "host/convert/Course.h"
 
 #include "host/convert/Amounts.h"
+#include "host/convert/CarryOver.h"
 #include "host/convert/EncodePlan.h"
 #include "host/convert/Room.h"
 #include "text/Path.h"
@@ -55,6 +56,8 @@ Course::Course(const Request& request, Movie& movie, Wishes& wishes, Observer& o
 Verdict Course::Run() {
     const bool lengthKnown = movie_.Info().certainty != Certainty::kGuessed;
     observer_.Started({request_.input, request_.output, length_, lengthKnown});
+    for (const NotCarried& left : CarryOver(movie_, ChooseFormat(request_), watch_.OptionSet()))
+        observer_.LeftBehind(left);
     if (lengthKnown || request_.length)
         WarnOfSmallRoom();
     clock_.Skip(Now());

@@ -64,6 +64,15 @@ struct Warning {
     std::string text; ///< A sentence without a full stop.
 };
 
+/// Something of the source that its output does not hold, although the conversion goes well.
+struct NotCarried {
+    std::string kind;          ///< "subtitles", "chapters", "cover", "attachment" or "data".
+    std::optional<int> number; ///< Of the stream in the source; nothing for chapters.
+    std::string codec;
+    std::string language; ///< Empty when it is not known.
+    std::string reason;   ///< A clause.
+};
+
 /// A picture for display: blue, green, red and 255 for each pixel, without gaps, top row first.
 struct ShownPicture {
     int width = 0;
@@ -103,6 +112,8 @@ public:
     /// The file is complete, on the disk, under its name.
     virtual void Closed(const ClosedFile&) {}
     virtual void Warned(const Warning&) {}
+    /// Once for each, after Started.
+    virtual void LeftBehind(const NotCarried&) {}
     virtual void Showed(const std::shared_ptr<const ShownPicture>&) {}
     virtual void Ended(const Verdict&) = 0;
 };

@@ -34,6 +34,9 @@ public:
     void Warned(const Warning& news) override {
         Post([news](Observer& observer) { observer.Warned(news); });
     }
+    void LeftBehind(const NotCarried& news) override {
+        Post([news](Observer& observer) { observer.LeftBehind(news); });
+    }
     void Showed(const std::shared_ptr<const ShownPicture>& news) override {
         Post([news](Observer& observer) { observer.Showed(news); });
     }

@@ -22,6 +22,9 @@ public:
 
     const SourceInfo& Info() const { return source_.Info(); }
 
+    /// The content of a cover or an attachment; empty for other streams. Only before the conversion.
+    std::vector<uint8_t> StoredFile(int stream) const { return source_.StoredFile(stream); }
+
     /// Null when the movie has no such stream or it was not asked for.
     VideoDecoder* Pictures() { return pictures_.get(); }
     AudioDecoder* Sound() { return sound_.get(); }

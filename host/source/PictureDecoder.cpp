@@ -1,6 +1,7 @@
 #include "host/source/PictureDecoder.h"
 
 #include "host/source/MediaTime.h"
+#include "host/source/SourceTime.h"
 
 #include <algorithm>
 #include <utility>
@@ -104,6 +105,7 @@ bool PictureDecoder::Advance() {
     image_.nPitchU = frame.linesize[1];
     image_.nPitchV = frame.linesize[2];
     image_.llTime = image_.llTime2 = current_.stamp.time;
+    TellSourceTime(image_.reserved, current_.stamp.time);
     image_.nDuration = static_cast<int32_t>(std::min<int64_t>(current_.stamp.duration, INT32_MAX));
     return true;
 }

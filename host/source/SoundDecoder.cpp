@@ -1,6 +1,7 @@
 #include "host/source/SoundDecoder.h"
 
 #include "host/source/MediaTime.h"
+#include "host/source/SourceTime.h"
 
 #include <algorithm>
 
@@ -103,6 +104,7 @@ AudioFrame* SoundDecoder::GetNextFrame() {
     block_.nBufferSize = static_cast<int32_t>(left);
     block_.llTime = block_.llTime2 =
         begin_ + av_rescale(samplesDelivered_, kTicksPerSecond, format.nSampleRate);
+    TellSourceTime(block_.reserved, block_.llTime);
     block_.nDuration =
         static_cast<int32_t>(av_rescale(bytes / frameBytes_, kTicksPerSecond, format.nSampleRate));
     used_ += bytes;

@@ -66,6 +66,19 @@ StreamInfo& Source::StreamOf(int index) {
     return info_.streams[static_cast<std::size_t>(index)];
 }
 
+std::vector<uint8_t> Source::StoredFile(int stream) const {
+    const AVFormatContext& context = *reader_.Context();
+    if (stream < 0 || stream >= static_cast<int>(context.nb_streams))
+        return {};
+    const AVStream& found = *context.streams[stream];
+    const AVCodecParameters& parameters = *found.codecpar;
+    if ((found.disposition & AV_DISPOSITION_ATTACHED_PIC) != 0)
+        return {found.attached_pic.data, found.attached_pic.data + found.attached_pic.size};
+    if (parameters.codec_type == AVMEDIA_TYPE_ATTACHMENT)
+        return {parameters.extradata, parameters.extradata + parameters.extradata_size};
+    return {};
+}
+
 const AVStream* Source::PictureStream() const {
     return info_.pictures ? reader_.Context()->streams[info_.pictures->index] : nullptr;
 }

@@ -26,6 +26,9 @@ public:
     /// Which streams are not converted although they are of the kinds asked for; empty when none is.
     const std::string& LeftOut() const { return leftOut_; }
 
+    /// The content of a cover or an attachment; empty for other streams.
+    std::vector<uint8_t> StoredFile(int stream) const;
+
     /// Null without such a stream. Valid until the reader rewinds.
     const AVStream* PictureStream() const;
     const AVStream* SoundStream() const;

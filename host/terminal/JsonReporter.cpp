@@ -83,6 +83,13 @@ void JsonReporter::Closed(const ClosedFile& report) {
                                      Number(report.audioSeconds), report.bytes));
 }
 
+void JsonReporter::LeftBehind(const NotCarried& report) {
+    Print("not_carried",
+          fmt::format("\"kind\":{},\"number\":{},\"codec\":{},\"language\":{},\"reason\":{}",
+                      JsonString(report.kind), report.number ? std::to_string(*report.number) : "null",
+                      JsonString(report.codec), JsonString(report.language), JsonString(report.reason)));
+}
+
 void JsonReporter::Warn(const std::string& text) {
     Print("warning", fmt::format("\"text\":{}", JsonString(text)));
 }

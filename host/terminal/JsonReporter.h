@@ -17,6 +17,7 @@ public:
     void Progressed(const Progress& report) override;
     void Opened(const OpenedFile& report) override;
     void Closed(const ClosedFile& report) override;
+    void LeftBehind(const NotCarried& report) override;
     void Warn(const std::string& text) override;
     void Error(const std::string& text) override;
     void End(const EndReport& report) override;

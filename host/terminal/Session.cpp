@@ -58,6 +58,10 @@ void Session::Warned(const Warning& news) {
     reporter_->Warned(news);
 }
 
+void Session::LeftBehind(const NotCarried& news) {
+    reporter_->LeftBehind(news);
+}
+
 void Session::Showed(const std::shared_ptr<const ShownPicture>& news) {
     if (preview_)
         preview_->Offer(news);

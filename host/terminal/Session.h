@@ -29,6 +29,7 @@ public:
     void Opened(const OpenedFile& news) override;
     void Closed(const ClosedFile& news) override;
     void Warned(const Warning& news) override;
+    void LeftBehind(const NotCarried& news) override;
     void Showed(const std::shared_ptr<const ShownPicture>& news) override;
     void Ended(const Verdict& news) override;
 

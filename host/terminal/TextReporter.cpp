@@ -63,6 +63,18 @@ void SparseReporter::Warn(const std::string& text) {
     Streams().PrintError(fmt::format("movieconv: warning: {}\n", text));
 }
 
+void SparseReporter::LeftBehind(const NotCarried& report) {
+    const std::string number = report.number ? fmt::format(" {}", *report.number) : std::string();
+    std::string details = report.codec;
+    if (!report.language.empty())
+        details += (details.empty() ? "" : ", ") + report.language;
+    if (!details.empty())
+        details = " (" + details + ")";
+    LeaveLine();
+    Streams().PrintError(
+        fmt::format("movieconv: not carried: {}{}{}: {}\n", report.kind, number, details, report.reason));
+}
+
 void SparseReporter::End(const EndReport& report) {
     if (!report.summary.empty())
         Streams().Print(report.summary + "\n");

@@ -26,6 +26,7 @@ class SparseReporter : public QuietReporter {
 public:
     using QuietReporter::QuietReporter;
     void Warn(const std::string& text) override;
+    void LeftBehind(const NotCarried& report) override;
     void End(const EndReport& report) override;
 };
 
