@@ -50,12 +50,12 @@ bool MovieReader::Rewind() {
         return true;
     // By the stream that begins first, lest the others be skipped up to where the usual one begins.
     const AVStream* first = nullptr;
-    const auto begin = [&](const AVStream* stream) {
+    const auto beginOf = [&](const AVStream* stream) {
         return stream->start_time != AV_NOPTS_VALUE ? MediaTime(stream->start_time, stream->time_base) : 0;
     };
     for (const int index : selected_) {
         const AVStream* stream = Context()->streams[index];
-        if (first == nullptr || begin(stream) < begin(first))
+        if (first == nullptr || beginOf(stream) < beginOf(first))
             first = stream;
     }
     const int64_t start = first->start_time != AV_NOPTS_VALUE ? first->start_time : 0;

@@ -1,17 +1,12 @@
 #include "host/source/PictureFilter.h"
 
+#include "host/source/FilterLibrary.h"
 #include "host/source/SourceError.h"
 
 #include <algorithm>
 #include <fmt/format.h>
 #include <new>
 #include <utility>
-
-extern "C" {
-#include <libavfilter/avfilter.h>
-#include <libavfilter/buffersink.h>
-#include <libavfilter/buffersrc.h>
-}
 
 namespace movieconv {
 namespace {
@@ -41,7 +36,7 @@ void CompleteColours(AVFrame& picture, int transfer) {
 } // namespace
 
 void PictureFilter::GraphFree::operator()(AVFilterGraph* graph) const {
-    avfilter_graph_free(&graph);
+    Filters().avfilter_graph_free(&graph);
 }
 
 PictureFilter::PictureFilter(const PictureStreamInfo& pictures, Deinterlace deinterlace)
@@ -63,14 +58,14 @@ bool PictureFilter::Push(AVFrame& picture, std::optional<int64_t> stamp, const S
         CompleteColours(picture, transfer_);
     picture.pts = count_++;
     stamps_.push_back(stamp);
-    Check(av_buffersrc_add_frame(entry_, &picture));
+    Check(Filters().av_buffersrc_add_frame(entry_, &picture));
     return HandOut(sink);
 }
 
 bool PictureFilter::Finish(const Sink& sink) {
     if (!graph_)
         return true;
-    Check(av_buffersrc_add_frame(entry_, nullptr));
+    Check(Filters().av_buffersrc_add_frame(entry_, nullptr));
     const bool goesOn = HandOut(sink);
     graph_.reset();
     stamps_.clear();
@@ -83,32 +78,32 @@ bool PictureFilter::Fits(const AVFrame& picture) const {
 }
 
 void PictureFilter::Build(const AVFrame& picture) {
-    graph_.reset(avfilter_graph_alloc());
+    graph_.reset(Filters().avfilter_graph_alloc());
     if (!graph_)
         throw std::bad_alloc();
     const std::string form = fmt::format("video_size={}x{}:pix_fmt={}:time_base=1/25:pixel_aspect=1/1",
                                          picture.width, picture.height, picture.format);
-    Check(avfilter_graph_create_filter(&entry_, avfilter_get_by_name("buffer"), "in", form.c_str(), nullptr,
-                                       graph_.get()));
-    Check(avfilter_graph_create_filter(&exit_, avfilter_get_by_name("buffersink"), "out", nullptr, nullptr,
-                                       graph_.get()));
+    Check(Filters().avfilter_graph_create_filter(&entry_, Filters().avfilter_get_by_name("buffer"), "in",
+                                                 form.c_str(), nullptr, graph_.get()));
+    Check(Filters().avfilter_graph_create_filter(&exit_, Filters().avfilter_get_by_name("buffersink"), "out",
+                                                 nullptr, nullptr, graph_.get()));
     std::string chain = deinterlace_ == Deinterlace::kAll       ? "bwdif=mode=send_frame:deint=all"
                         : deinterlace_ == Deinterlace::kFlagged ? "bwdif=mode=send_frame:deint=interlaced"
                                                                 : "";
     if (transfer_ != 0)
         chain += (chain.empty() ? "" : ",") + std::string(kToneMap);
-    AVFilterInOut* inputs = avfilter_inout_alloc();
-    AVFilterInOut* outputs = avfilter_inout_alloc();
+    AVFilterInOut* inputs = Filters().avfilter_inout_alloc();
+    AVFilterInOut* outputs = Filters().avfilter_inout_alloc();
     int result = AVERROR(ENOMEM);
     if (inputs != nullptr && outputs != nullptr) {
         *outputs = {av_strdup("in"), entry_, 0, nullptr};
         *inputs = {av_strdup("out"), exit_, 0, nullptr};
-        result = avfilter_graph_parse_ptr(graph_.get(), chain.c_str(), &inputs, &outputs, nullptr);
+        result = Filters().avfilter_graph_parse_ptr(graph_.get(), chain.c_str(), &inputs, &outputs, nullptr);
     }
-    avfilter_inout_free(&inputs);
-    avfilter_inout_free(&outputs);
+    Filters().avfilter_inout_free(&inputs);
+    Filters().avfilter_inout_free(&outputs);
     Check(result);
-    Check(avfilter_graph_config(graph_.get(), nullptr));
+    Check(Filters().avfilter_graph_config(graph_.get(), nullptr));
     form_ = av::NewFrame();
     form_->width = picture.width;
     form_->height = picture.height;
@@ -118,7 +113,7 @@ void PictureFilter::Build(const AVFrame& picture) {
 bool PictureFilter::HandOut(const Sink& sink) {
     for (;;) {
         const av::Frame picture = av::NewFrame();
-        const int result = av_buffersink_get_frame(exit_, picture.get());
+        const int result = Filters().av_buffersink_get_frame(exit_, picture.get());
         if (result == AVERROR(EAGAIN) || result == AVERROR_EOF)
             return true;
         Check(result);
