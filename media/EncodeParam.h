@@ -12,8 +12,8 @@
 
 #pragma pack(push, 4)
 
-/// What to encode: 104 bytes, no padding. MCSetEncodeParam completes fields that are 0, from the source or by
-/// defaults.
+/// What to encode: 104 bytes, no padding. MCSetEncodeParam says which fields it completes when they are 0.
+/// The codes of formats and codecs stand in docs/decoders.md.
 typedef struct EncodeParam {
     uint32_t fccVideo;        ///< Video codec, "XVID" by default.
     uint32_t fccColorFormat;  ///< Picture format handed to the media writer, "YV12" by default.
@@ -24,7 +24,7 @@ typedef struct EncodeParam {
     int32_t nVideoRateMode;   ///< 0: one video bit rate; otherwise a target rate and an upper rate.
     int32_t nVideoBitrate;    ///< Video bit rate in bits per second.
     int32_t nVideoMaxBitrate; ///< Upper video bit rate in bits per second, used in two-rate mode.
-    int32_t bResize;          ///< How the writer fits pictures into the output size; see the media writer.
+    int32_t bResize;          ///< 0: pictures of another shape get bars; else they fill the output.
     uint32_t nReserved[5];    ///< Carried along unread; the media writer gives word 0 a meaning, 0 is none.
     uint32_t fccAudio;        ///< Audio codec, "AAC " by default.
     int32_t nSampleRate;      ///< Audio samples per second and channel.
