@@ -8,6 +8,7 @@ extern "C" {
 }
 
 #include <algorithm>
+#include <array>
 #include <cmath>
 #include <string>
 #include <thread>
@@ -54,6 +55,27 @@ std::string FormatText(const EncodeParam& param) {
     return "\"" + CodeText(param.fccFileFormat) + "\"";
 }
 
+constexpr int kUsualSpeed = 5;
+constexpr std::array kProfiles{"baseline", "main", "high"};
+
+void SetCompression(PictureSettings& settings, const PictureCodec& codec, const WriterOptions& options) {
+    const int speed = options.nSpeed != 0 ? options.nSpeed : kUsualSpeed;
+    const QualityScale& scale = codec.quality;
+    if (speed < 1 || speed > static_cast<int>(codec.speed.values.size()) || options.nProfile < 0 ||
+        options.nProfile > static_cast<int>(kProfiles.size()))
+        throw WriterFailure(kWriterErrorArgument, "There is no such speed or profile.");
+    settings.speed = speed - 1;
+    if (options.nProfile > 0 && codec.id == AV_CODEC_ID_H264)
+        settings.profile = kProfiles.at(static_cast<std::size_t>(options.nProfile) - 1);
+    if (options.bQuality == 0)
+        return;
+    if (scale.kind == QualityKind::kNone ||
+        !(options.dQuality >= scale.best && options.dQuality <= scale.worst))
+        throw WriterFailure(kWriterErrorArgument, "\"" + CodeText(codec.code) + "\" has no quality of " +
+                                                      std::to_string(options.dQuality) + ".");
+    settings.quality = options.dQuality;
+}
+
 PictureSettings MakePictureSettings(const EncodeParam& param, const VideoFormat& source,
                                     const PictureCodec& codec, const WriterOptions& options) {
     PictureSettings settings{};
@@ -70,6 +92,7 @@ PictureSettings MakePictureSettings(const EncodeParam& param, const VideoFormat&
     settings.bitrate = FirstPositive(param.nVideoBitrate, kDefaultVideoBitrate, 0);
     settings.maxBitrate = param.nVideoRateMode != 0 ? std::max(0, param.nVideoMaxBitrate) : 0;
     settings.threads = ChooseThreads(codec, options);
+    SetCompression(settings, codec, options);
     settings.primaries = ColorCode<AVColorPrimaries>(options.nColorPrimaries, AVCOL_PRI_NB);
     settings.transfer = ColorCode<AVColorTransferCharacteristic>(options.nColorTransfer, AVCOL_TRC_NB);
     settings.matrix = ColorCode<AVColorSpace>(options.nColorMatrix, AVCOL_SPC_NB);

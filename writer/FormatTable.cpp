@@ -21,12 +21,16 @@ constexpr uint32_t kHevc = FourCC("HEVC");
 constexpr uint32_t kMjpg = FourCC("MJPG");
 constexpr uint32_t kVp8 = FourCC("VP80");
 constexpr uint32_t kVp9 = FourCC("VP90");
+constexpr uint32_t kAv1 = FourCC("AV01");
+constexpr uint32_t kFfv1 = FourCC("FFV1");
 constexpr uint32_t kMpeg2 = FourCC("MPG2");
 constexpr uint32_t kFlv1 = FourCC("FLV1");
 constexpr uint32_t kAac = FourCC("AAC ");
 constexpr uint32_t kMp3 = FourCC("MP3 ");
 constexpr uint32_t kAc3 = FourCC("AC3 ");
 constexpr uint32_t kFlac = FourCC("FLAC");
+constexpr uint32_t kAlac = FourCC("ALAC");
+constexpr uint32_t kMp2 = FourCC("MP2 ");
 constexpr uint32_t kOpus = FourCC("OPUS");
 constexpr uint32_t kVorbis = FourCC("VORB");
 constexpr uint32_t kPcm = FourCC("PCM ");
@@ -34,18 +38,34 @@ constexpr uint32_t kPcm = FourCC("PCM ");
 // clang-format off
 constexpr AVPixelFormat kPlanar = AV_PIX_FMT_YUV420P;
 constexpr AVPixelFormat kPlanarFull = AV_PIX_FMT_YUVJ420P;
-constexpr const char* kVpxOptions = "deadline=good,cpu-used=4";
+
+constexpr QualityScale kNoQuality{QualityKind::kNone, 0, 0};
+constexpr QualityScale kCrf51{QualityKind::kCrf, 0, 51};
+constexpr QualityScale kCrf63{QualityKind::kCrf, 0, 63};
+constexpr QualityScale kCapped63{QualityKind::kCappedCrf, 4, 63};
+constexpr QualityScale kQuantiser{QualityKind::kQuantiser, 1, 31};
+
+constexpr SpeedScale kOneSpeed{nullptr, {}};
+constexpr SpeedScale kX26Speeds{"preset", {"veryslow", "slower", "slow", "medium", "fast", "veryfast", "ultrafast"}};
+constexpr SpeedScale kVpxSpeeds{"cpu-used", {"0", "1", "2", "3", "4", "5", "8"}};
+constexpr SpeedScale kAv1Speeds{"preset", {"2", "4", "6", "8", "10", "11", "12"}};
+
+// Frames encoded side by side can wait for each other for ever at the end; rows still are.
+constexpr const char* kX265Options = "x265-params=log-level=none:frame-threads=1";
+constexpr const char* kVpxOptions = "deadline=good";
+constexpr const char* kFfv1Options = "level=3,g=1,slicecrc=1"; // every picture by itself, with a check sum
+
 constexpr std::array kPictureCodecs{
-    PictureCodec{kXvid,  AV_CODEC_ID_MPEG4,      "mpeg4",      kPlanar,     false, 0.0, nullptr},
-    PictureCodec{kH264,  AV_CODEC_ID_H264,       "libx264",    kPlanar,     true,  1.5, "preset=fast"},
-    // Frames encoded side by side can wait for each other for ever at the end; rows still are.
-    PictureCodec{kHevc,  AV_CODEC_ID_HEVC,       "libx265",    kPlanar,     true,  0.0,
-                 "preset=fast,x265-params=log-level=none:frame-threads=1"},
-    PictureCodec{kMjpg,  AV_CODEC_ID_MJPEG,      "mjpeg",      kPlanarFull, false, 0.0, nullptr},
-    PictureCodec{kVp8,   AV_CODEC_ID_VP8,        "libvpx",     kPlanar,     false, 1.0, kVpxOptions},
-    PictureCodec{kVp9,   AV_CODEC_ID_VP9,        "libvpx-vp9", kPlanar,     false, 1.0, kVpxOptions},
-    PictureCodec{kMpeg2, AV_CODEC_ID_MPEG2VIDEO, "mpeg2video", kPlanar,     false, 0.0, nullptr},
-    PictureCodec{kFlv1,  AV_CODEC_ID_FLV1,       "flv",        kPlanar,     false, 0.0, nullptr},
+    PictureCodec{kXvid,  AV_CODEC_ID_MPEG4,      "mpeg4",      kPlanar,     false, 0.0, kQuantiser, kOneSpeed, ""},
+    PictureCodec{kH264,  AV_CODEC_ID_H264,       "libx264",    kPlanar,     true,  1.5, kCrf51, kX26Speeds, ""},
+    PictureCodec{kHevc,  AV_CODEC_ID_HEVC,       "libx265",    kPlanar,     true,  0.0, kCrf51, kX26Speeds, kX265Options},
+    PictureCodec{kMjpg,  AV_CODEC_ID_MJPEG,      "mjpeg",      kPlanarFull, false, 0.0, kQuantiser, kOneSpeed, ""},
+    PictureCodec{kVp8,   AV_CODEC_ID_VP8,        "libvpx",     kPlanar,     false, 1.0, kCapped63, kVpxSpeeds, kVpxOptions},
+    PictureCodec{kVp9,   AV_CODEC_ID_VP9,        "libvpx-vp9", kPlanar,     false, 1.0, kCrf63, kVpxSpeeds, kVpxOptions},
+    PictureCodec{kAv1,   AV_CODEC_ID_AV1,        "libsvtav1",  kPlanar,     true,  0.0, kCrf63, kAv1Speeds, ""},
+    PictureCodec{kFfv1,  AV_CODEC_ID_FFV1,       "ffv1",       kPlanar,     false, 1.0, kNoQuality, kOneSpeed, kFfv1Options},
+    PictureCodec{kMpeg2, AV_CODEC_ID_MPEG2VIDEO, "mpeg2video", kPlanar,     false, 0.0, kQuantiser, kOneSpeed, ""},
+    PictureCodec{kFlv1,  AV_CODEC_ID_FLV1,       "flv",        kPlanar,     false, 0.0, kQuantiser, kOneSpeed, ""},
 };
 
 // The limits of AAC are the format's (6144 bits for a frame of 1024 samples), those of the others their encoders'.
@@ -54,6 +74,8 @@ constexpr std::array kSoundCodecs{
     SoundCodec{kMp3,    AV_CODEC_ID_MP3,       "libmp3lame", 2, 0.5, 8.0},
     SoundCodec{kAc3,    AV_CODEC_ID_AC3,       "ac3",        6, 0.5, 14.0},
     SoundCodec{kFlac,   AV_CODEC_ID_FLAC,      "flac",       8, 0.0, 0.0},
+    SoundCodec{kAlac,   AV_CODEC_ID_ALAC,      "alac",       8, 0.0, 0.0},
+    SoundCodec{kMp2,    AV_CODEC_ID_MP2,       "mp2",        2, 0.3, 8.0},
     SoundCodec{kOpus,   AV_CODEC_ID_OPUS,      "libopus",    8, 0.2, 5.3},
     SoundCodec{kVorbis, AV_CODEC_ID_VORBIS,    "libvorbis",  8, 1.0, 3.8, 48000},
     SoundCodec{kPcm,    AV_CODEC_ID_PCM_S16LE, "pcm_s16le",  8, 0.0, 0.0},
@@ -68,26 +90,28 @@ constexpr const char* kClusters = "cluster_time_limit=1000"; // what is lost at 
 constexpr std::array kContainers{
     Container{FourCC("MP4 "), "MP4 (MPEG-4 Part 14)", "mp4,m4v", "mp4", kFragmented, nullptr,
               kTags | kChapters | kCover, false,
-              {kXvid, kH264, kHevc, kMjpg, kVp9, kMpeg2}, {kAac, kMp3, kAc3, kOpus, kVorbis}},
+              {kXvid, kH264, kHevc, kMjpg, kVp9, kMpeg2, kAv1}, {kAac, kMp3, kAc3, kOpus, kVorbis}},
     Container{FourCC("MOV "), "QuickTime", "mov,qt", "mov", kFragmented, nullptr,
               kTags | kChapters, false,
-              {kXvid, kH264, kHevc, kMjpg, kMpeg2}, {kAac, kMp3, kAc3, kPcm}},
+              {kXvid, kH264, kHevc, kMjpg, kMpeg2}, {kAac, kMp3, kAc3, kAlac, kPcm}},
     Container{FourCC("MKV "), "Matroska", "mkv", "matroska", kStreamed, kClusters,
               kTags | kChapters | kCover | kFiles, false,
-              {kXvid, kH264, kHevc, kMjpg, kVp8, kVp9, kMpeg2, kFlv1},
-              {kAac, kMp3, kAc3, kFlac, kOpus, kVorbis, kPcm}},
+              {kXvid, kH264, kHevc, kMjpg, kVp8, kVp9, kMpeg2, kFlv1, kAv1, kFfv1},
+              {kAac, kMp3, kAc3, kFlac, kOpus, kVorbis, kAlac, kMp2, kPcm}},
     Container{FourCC("AVI "), "AVI (Audio Video Interleaved)", "avi,divx", "avi", kSteadyRate, nullptr,
               kTags, false,
               {kXvid, kH264, kMjpg, kVp8, kMpeg2, kFlv1}, {kMp3, kAac, kAc3, kPcm}},
     Container{FourCC("WEBM"), "WebM", "webm", "webm", kStreamed, kClusters,
-              kTags | kChapters, false, {kVp8, kVp9}, {kVorbis, kOpus}},
+              kTags | kChapters, false, {kVp8, kVp9, kAv1}, {kVorbis, kOpus}},
     Container{FourCC("FLV "), "Flash Video", "flv", "flv", kStreamed, nullptr,
               kTags, false, {kH264, kFlv1}, {kAac, kMp3}},
     Container{FourCC("TS  "), "MPEG transport stream", "ts,m2ts,mts", "mpegts", kStreamed, nullptr,
               kTags, false,
-              {kH264, kHevc, kXvid, kMpeg2}, {kAac, kMp3, kAc3, kOpus}},
+              {kH264, kHevc, kXvid, kMpeg2}, {kAac, kMp3, kAc3, kOpus, kMp2}},
+    Container{FourCC("MPG "), "MPEG program stream", "mpg,mpeg,vob", "vob", kStreamed, nullptr,
+              0, false, {kMpeg2}, {kMp2, kAc3}},
     Container{FourCC("M4A "), "MPEG-4 audio", "m4a,m4b", "ipod", kFragmented, nullptr,
-              kTags | kChapters | kCover, false, {}, {kAac, kAc3}},
+              kTags | kChapters | kCover, false, {}, {kAac, kAc3, kAlac}},
     Container{FourCC("MP3 "), "MP3", "mp3", "mp3", kStreamed, nullptr,
               kTags | kCover, false, {}, {kMp3}},
     Container{FourCC("WAV "), "WAV (RIFF wave)", "wav", "wav", kSteadyRate, "rf64=auto",
@@ -118,6 +142,7 @@ constexpr std::array kAliases{
     std::pair{FourCC("H265"), kHevc}, std::pair{FourCC("HVC1"), kHevc},  std::pair{FourCC("HEV1"), kHevc},
     std::pair{FourCC("X265"), kHevc}, std::pair{FourCC("JPEG"), kMjpg},  std::pair{FourCC("VP8 "), kVp8},
     std::pair{FourCC("VP9 "), kVp9},  std::pair{FourCC("VP09"), kVp9},   std::pair{FourCC("MP2V"), kMpeg2},
+    std::pair{FourCC("AV1 "), kAv1},
     std::pair{FourCC("MP4A"), kAac},  std::pair{FourCC(".MP3"), kMp3},   std::pair{FourCC("AC-3"), kAc3},
     std::pair{FourCC("LPCM"), kPcm},  std::pair{FourCC("SOWT"), kPcm},
 };
@@ -144,7 +169,7 @@ const typename Table::value_type* FindByCode(const Table& table, uint32_t code) 
 }
 
 template <typename Table>
-const typename Table::value_type* FindFitting(const Table& table, const std::array<uint32_t, 10>& fitting,
+const typename Table::value_type* FindFitting(const Table& table, const std::array<uint32_t, 12>& fitting,
                                               uint32_t code) {
     const uint32_t canonical = Canonical(code);
     const bool fits = canonical != 0 && std::find(fitting.begin(), fitting.end(), canonical) != fitting.end();
@@ -159,7 +184,7 @@ bool CanEncode(const Table& table, uint32_t code) {
 
 /// The codes from `fitting` that can be encoded here, into the zeroed list `codes`; true when there is one.
 template <typename Table>
-bool CopyEncodable(const Table& table, const std::array<uint32_t, 10>& fitting, uint32_t* codes) {
+bool CopyEncodable(const Table& table, const std::array<uint32_t, 12>& fitting, uint32_t* codes) {
     const auto canEncode = [&](uint32_t code) { return code != 0 && CanEncode(table, code); };
     return std::copy_if(fitting.begin(), fitting.end(), codes, canEncode) != codes;
 }
@@ -178,6 +203,10 @@ FileFormatInfo Describe(const Container& container) {
 
 const Container* FindContainer(uint32_t code) {
     return code == 0 ? nullptr : FindByCode(kContainers, Canonical(code));
+}
+
+const PictureCodec* FindPictureCodec(uint32_t code) {
+    return FindByCode(kPictureCodecs, Canonical(code));
 }
 
 const PictureCodec* FindPictureCodec(const Container& container, uint32_t code) {

@@ -14,6 +14,26 @@ extern "C" {
 
 namespace writer {
 
+/// How an encoder is told a constant quality; less is better.
+enum class QualityKind {
+    kNone,
+    kCrf,       ///< The encoder's option "crf".
+    kCappedCrf, ///< Likewise, below a bit rate that it needs as well.
+    kQuantiser  ///< The quantiser of every picture.
+};
+
+struct QualityScale {
+    QualityKind kind;
+    double best;
+    double worst;
+};
+
+/// How an encoder is told how long to look for a smaller file.
+struct SpeedScale {
+    const char* option;                ///< Null: it has no such choice.
+    std::array<const char*, 7> values; ///< From the slowest.
+};
+
 /// A codec for pictures.
 struct PictureCodec {
     uint32_t code;
@@ -24,9 +44,9 @@ struct PictureCodec {
     /// Threads for each processor where the caller leaves the choice: 0 for one thread. The output depends on
     /// their number, never on timing.
     double threads;
-    /// Speed and quality of an encoder that leaves the choice to the caller, its own options as
-    /// "name=value,...", and that it has to be told how far key frames may lie apart; null: neither.
-    const char* options;
+    QualityScale quality;
+    SpeedScale speed;    ///< An encoder that has one has to be told how far key frames may lie apart.
+    const char* options; ///< For the encoder in any case, as "name=value,...".
 };
 
 /// A codec for sound.
@@ -67,8 +87,8 @@ struct Container {
     const char* options;            ///< The multiplexer's own, as "name=value,...".
     uint32_t carries;               ///< kWriterFormat... of what goes in beside pictures and sound.
     bool tagsInStream;              ///< Texts about the movie belong to its stream.
-    std::array<uint32_t, 10> video; ///< Codes of the codecs that fit, the default first, then zeros.
-    std::array<uint32_t, 10> audio;
+    std::array<uint32_t, 12> video; ///< Codes of the codecs that fit, the default first, then zeros.
+    std::array<uint32_t, 12> audio;
 };
 
 /// Null when the code is not in the table.
@@ -78,6 +98,9 @@ const Container* FindContainer(uint32_t code);
 /// carry it.
 const PictureCodec* FindPictureCodec(const Container& container, uint32_t code);
 const SoundCodec* FindSoundCodec(const Container& container, uint32_t code);
+
+/// The codec of that code, whatever carries it; null when there is none.
+const PictureCodec* FindPictureCodec(uint32_t code);
 
 /// This FFmpeg build's encoder; null when it has none. `bitsPerSample` chooses among those for PCM.
 const AVCodec* FindEncoder(const PictureCodec& codec);

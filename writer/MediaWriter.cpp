@@ -132,6 +132,15 @@ uint32_t MWRegisterOptions(const WriterOptions* options) {
     });
 }
 
+int MWGetQualityScale(uint32_t code, double* best, double* worst) {
+    const writer::PictureCodec* codec = writer::FindPictureCodec(code);
+    if (codec == nullptr || codec->quality.kind == writer::QualityKind::kNone)
+        return 0;
+    *best = codec->quality.best;
+    *worst = codec->quality.worst;
+    return 1;
+}
+
 uint32_t MWFindCodec(uint32_t format, uint32_t code, int forSound) {
     const writer::Container* container = writer::FindContainer(format);
     if (container == nullptr)

@@ -15,12 +15,46 @@ namespace {
 /// cut off.
 constexpr int kKeyFrameSeconds = 5;
 
-/// Speed and quality of the encoders that leave the choice to the caller.
-void SetPreset(AVCodecContext& context, const PictureCodec& codec, AVRational rate) {
-    if (codec.options == nullptr)
+void SetOption(AVCodecContext& context, const char* name, const std::string& value) {
+    av::CheckMemory(av_opt_set(&context, name, value.c_str(), AV_OPT_SEARCH_CHILDREN));
+}
+
+/// Options as the table has them, the encoder's own and those that all have.
+void SetOptions(AVCodecContext& context, const std::string& options) {
+    for (std::size_t at = 0; at < options.size();) {
+        const std::size_t end = std::min(options.find(',', at), options.size());
+        const std::size_t equals = options.find('=', at);
+        SetOption(context, options.substr(at, equals - at).c_str(),
+                  options.substr(equals + 1, end - equals - 1));
+        at = end + 1;
+    }
+}
+
+void SetSpeed(AVCodecContext& context, const SpeedScale& scale, const PictureSettings& settings) {
+    if (scale.option == nullptr)
         return;
-    av::CheckMemory(av_set_options_string(context.priv_data, codec.options, "=", ","));
-    context.gop_size = std::max(1, static_cast<int>(std::lround(av_q2d(rate) * kKeyFrameSeconds)));
+    SetOption(context, scale.option, scale.values.at(static_cast<std::size_t>(settings.speed)));
+    context.gop_size = std::max(1, static_cast<int>(std::lround(av_q2d(settings.rate) * kKeyFrameSeconds)));
+}
+
+void SetQuality(AVCodecContext& context, const QualityScale& scale, double quality) {
+    constexpr double kMostBitsPerPixel = 0.5; // more than the best quality needs
+    switch (scale.kind) {
+    case QualityKind::kNone:
+        break;
+    case QualityKind::kQuantiser:
+        context.flags |= AV_CODEC_FLAG_QSCALE;
+        context.global_quality = static_cast<int>(std::lround(FF_QP2LAMBDA * quality));
+        break;
+    case QualityKind::kCappedCrf:
+    case QualityKind::kCrf:
+        SetOption(context, "crf", std::to_string(quality));
+        context.bit_rate = scale.kind == QualityKind::kCrf
+                               ? 0
+                               : std::llround(kMostBitsPerPixel * context.width * context.height *
+                                              av_q2d(context.framerate));
+        break;
+    }
 }
 
 } // namespace
@@ -53,7 +87,12 @@ PictureEncoder::PictureEncoder(const PictureCodec& codec, const PictureSettings&
     context.color_primaries = settings.primaries;
     context.color_trc = settings.transfer;
     context.colorspace = settings.matrix;
-    SetPreset(context, codec, settings.rate);
+    SetOptions(context, codec.options);
+    SetSpeed(context, codec.speed, settings);
+    if (settings.profile != nullptr)
+        SetOption(context, "profile", settings.profile);
+    if (settings.quality)
+        SetQuality(context, codec.quality, *settings.quality);
     OpenEncoder(context, codec.code,
                 "pictures of " + std::to_string(settings.width) + "x" + std::to_string(settings.height) +
                     " at " + std::to_string(av_q2d(settings.rate)) + " a second and " +
@@ -64,6 +103,7 @@ void PictureEncoder::Encode(AVFrame& frame, int64_t tick, const PacketTaker& tak
     ticks_.push_back(tick);
     frame.pts = nextIndex_++;
     frame.pict_type = AV_PICTURE_TYPE_NONE;
+    frame.quality = context_->global_quality;
     Send(&frame, take);
 }
 

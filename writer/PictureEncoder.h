@@ -7,6 +7,7 @@
 
 #include <cstdint>
 #include <deque>
+#include <optional>
 
 namespace writer {
 
@@ -16,8 +17,11 @@ struct PictureSettings {
     int height;
     AVRational rate;
     AVRational sampleAspect;
-    int64_t bitrate;    ///< Bits per second.
-    int64_t maxBitrate; ///< Upper rate; 0: no limit.
+    int64_t bitrate;               ///< Bits per second.
+    int64_t maxBitrate;            ///< Upper rate; 0: no limit.
+    std::optional<double> quality; ///< On the codec's scale, instead of the bit rate.
+    int speed;                     ///< Place on the codec's scale, from the slowest.
+    const char* profile;           ///< Of H.264; null: the encoder's choice.
     int threads;
     bool inOrder; ///< Pictures are coded in the order in which they are shown.
     AVPixelFormat format;

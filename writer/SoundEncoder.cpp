@@ -1,6 +1,7 @@
 #include "writer/SoundEncoder.h"
 
 #include <algorithm>
+#include <array>
 #include <new>
 #include <string>
 
@@ -45,13 +46,27 @@ void ChooseLayout(const AVCodec& codec, int asked, AVChannelLayout& layout) {
     }
 }
 
-AVSampleFormat ChooseSampleFormat(const AVCodec& codec, int bitsPerSample) {
+AVSampleFormat ChooseSampleFormat(const AVCodec& codec, int bitsPerSample, bool lossless) {
+    const AVSampleFormat wanted = bitsPerSample > 16 ? AV_SAMPLE_FMT_S32
+                                  : lossless         ? AV_SAMPLE_FMT_S16
+                                                     : AV_SAMPLE_FMT_NONE;
     if (codec.sample_fmts == nullptr)
         return AV_SAMPLE_FMT_S16;
     for (const AVSampleFormat* format = codec.sample_fmts; *format != AV_SAMPLE_FMT_NONE; ++format)
-        if (bitsPerSample > 16 && *format == AV_SAMPLE_FMT_S32)
+        if (av_get_packed_sample_fmt(*format) == wanted)
             return *format;
     return codec.sample_fmts[0];
+}
+
+/// The lowest rate of MPEG audio layer 2 that is not below `asked`, or the highest; it has no others.
+int64_t NearestMp2Rate(int64_t asked, int sampleRate) {
+    static constexpr std::array kRates{32, 48, 56, 64, 80, 96, 112, 128, 160, 192, 224, 256, 320, 384};
+    static constexpr std::array kRatesBelow32kHz{8, 16, 24, 32, 40, 48, 56, 64, 80, 96, 112, 128, 144, 160};
+    const auto& rates = sampleRate < 32000 ? kRatesBelow32kHz : kRates;
+    for (const int rate : rates)
+        if (rate * 1000 >= asked)
+            return rate * 1000;
+    return rates.back() * 1000;
 }
 
 int64_t ClampBitrate(const SoundCodec& codec, int64_t asked, const AVCodecContext& context) {
@@ -72,10 +87,12 @@ SoundEncoder::SoundEncoder(const SoundCodec& codec, const SoundSettings& setting
     context.sample_rate = ChooseSampleRate(
         settings.sampleRates != nullptr ? settings.sampleRates : context.codec->supported_samplerates, rate);
     context.time_base = {1, context.sample_rate};
-    context.sample_fmt = ChooseSampleFormat(*context.codec, settings.bitsPerSample);
+    context.sample_fmt = ChooseSampleFormat(*context.codec, settings.bitsPerSample, codec.maxBits == 0);
     ChooseLayout(*context.codec, std::min(settings.channels, codec.maxChannels), context.ch_layout);
     if (codec.maxBits > 0) {
         context.bit_rate = ClampBitrate(codec, settings.bitrate, context);
+        if (codec.id == AV_CODEC_ID_MP2)
+            context.bit_rate = NearestMp2Rate(context.bit_rate, context.sample_rate);
         context.rc_max_rate = settings.maxBitrate > 0 ? std::max(settings.maxBitrate, context.bit_rate) : 0;
     }
     context.thread_count = 1;
@@ -87,12 +104,46 @@ SoundEncoder::SoundEncoder(const SoundCodec& codec, const SoundSettings& setting
 }
 
 void SoundEncoder::Encode(AVFrame& frame, const PacketTaker& take) {
+    const int samples = frame.nb_samples;
+    if (samples < frameSize_ && KeepsTheEnd()) // after a shorter one the encoder would take no more
+        Send(*FillUp(&frame), take);
+    else
+        Send(frame, take);
+    samples_ += samples;
+}
+
+void SoundEncoder::Send(AVFrame& frame, const PacketTaker& take) {
     frame.pts = samples_;
-    samples_ += frame.nb_samples;
     writer::Encode(*context_, &frame, *packet_, take);
 }
 
+/// Encoders that hold nothing back and yet delay the sound keep its end unless more follows.
+bool SoundEncoder::KeepsTheEnd() const {
+    return (context_->codec->capabilities & AV_CODEC_CAP_DELAY) == 0 && context_->initial_padding > 0;
+}
+
+/// A whole frame that begins with the samples of `beginning`.
+av::Frame SoundEncoder::FillUp(const AVFrame* beginning) const {
+    av::Frame frame = av::NewFrame();
+    const int channels = context_->ch_layout.nb_channels;
+    frame->nb_samples = frameSize_;
+    frame->format = context_->sample_fmt;
+    frame->sample_rate = context_->sample_rate;
+    av::CheckMemory(av_channel_layout_copy(&frame->ch_layout, &context_->ch_layout));
+    av::CheckMemory(av_frame_get_buffer(frame.get(), 0));
+    av_samples_set_silence(frame->extended_data, 0, frameSize_, channels, context_->sample_fmt);
+    if (beginning != nullptr)
+        av_samples_copy(frame->extended_data, beginning->extended_data, 0, 0, beginning->nb_samples, channels,
+                        context_->sample_fmt);
+    return frame;
+}
+
 void SoundEncoder::Finish(const PacketTaker& take) {
+    const int64_t filledUp = (frameSize_ - samples_ % frameSize_) % frameSize_;
+    if (samples_ > 0 && KeepsTheEnd() && filledUp < context_->initial_padding) {
+        samples_ += filledUp;
+        Send(*FillUp(nullptr), take);
+    }
     writer::Encode(*context_, nullptr, *packet_, take);
 }
 

@@ -39,6 +39,10 @@ public:
     const AVCodecContext& Context() const { return *context_; }
 
 private:
+    void Send(AVFrame& frame, const PacketTaker& take);
+    bool KeepsTheEnd() const;
+    av::Frame FillUp(const AVFrame* beginning) const;
+
     av::CodecContext context_;
     av::Packet packet_;
     int frameSize_ = 0;

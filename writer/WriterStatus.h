@@ -148,6 +148,12 @@ typedef struct WriterOptions {
     WriterListener pfnListener; ///< May be null.
     WriterFullDiskHandler pfnFullDisk; ///< Null: a full disk fails the file at once.
     void* pContext;                    ///< First argument of both.
+    int32_t bQuality; ///< Nonzero: pictures of constant quality instead of EncodeParam's bit rate.
+    /// How long the picture encoder looks for a smaller file: 1 longest to 7 shortest; 0 is 5. Codecs without
+    /// such a choice ignore it.
+    int32_t nSpeed;
+    double dQuality;  ///< On the codec's own scale, where less is better; see MWGetQualityScale.
+    int32_t nProfile; ///< Of H.264: 1 baseline, 2 main, 3 high; 0: as the encoder likes.
 } WriterOptions;
 
 /// What distinguishes a file format beside what FileFormatInfo says.
@@ -237,6 +243,10 @@ void MWForwardLog(int forward);
 /// The table's code of a codec for pictures (`forSound` 0) or sound that files of `format` can carry and this
 /// build of FFmpeg can encode, asked for by any of its names; 0 when there is none.
 uint32_t MWFindCodec(uint32_t format, uint32_t code, int forSound);
+
+/// The scale of a picture codec's constant quality, from the best figure to the worst. Returns 1; 0 when the
+/// codec has none or is not known.
+int MWGetQualityScale(uint32_t code, double* best, double* worst);
 
 #pragma GCC visibility pop
 #undef MW_SIZE_OF

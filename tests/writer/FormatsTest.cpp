@@ -1,5 +1,6 @@
 // Every format with every codec that the table says it carries: written, then read back and decoded.
 #include "MovieReader.h"
+#include "tests/support/Folder.h"
 #include "writer/FormatTable.h"
 
 #include <gtest/gtest.h>
@@ -96,6 +97,61 @@ TEST_P(PictureFormats, KeepPicturesWithoutSound) {
     const ReadMovie read = WriteAndRead(movie_);
     EXPECT_TRUE(read.readable);
     EXPECT_EQ(read.pictures.size(), 5U);
+}
+
+/// Bytes of a short file of that codec, by itself, with these options; 0 when it is refused.
+int64_t SizeWith(uint32_t format, uint32_t codec, const WriterOptions& options) {
+    const Folder folder;
+    const uint32_t set = MWRegisterOptions(&options);
+    TestMovie movie;
+    movie.width = 320;
+    movie.height = 240;
+    movie.pictures = 20;
+    movie.hasAudio = false;
+    movie.param.fccFileFormat = format;
+    movie.param.fccVideo = codec;
+    movie.param.nReserved[kWriterSetWord] = set;
+    const bool written = movie.Write(folder / "movie");
+    const int64_t size = Latest(set).llBytesWritten;
+    MWUnregisterOptions(set);
+    return written ? size : 0;
+}
+
+TEST_P(PictureFormats, TakeAQualityOfTheCodecsScale) {
+    const auto [format, codec, sound] = GetParam();
+    WriterOptions options{};
+    options.bQuality = 1;
+    double best = 0;
+    double worst = 0;
+    if (MWGetQualityScale(codec, &best, &worst) == 0) {
+        EXPECT_EQ(SizeWith(format, codec, options), 0) << "a quality of no scale is refused";
+        return;
+    }
+    const auto size = [&, format = format, codec = codec](double quality) {
+        options.dQuality = quality;
+        return SizeWith(format, codec, options);
+    };
+    const int64_t small = size(best + 0.8 * (worst - best));
+    EXPECT_GT(small, 0);
+    EXPECT_GT(size(best + 0.05 * (worst - best)), small);
+    EXPECT_EQ(size(worst + 1), 0);
+    EXPECT_EQ(size(best - 1), 0);
+}
+
+TEST(Speed, IsTheEncodersChoiceOfTools) {
+    const auto size = [](int speed, int profile) {
+        WriterOptions options{};
+        options.bQuality = 1;
+        options.dQuality = 24;
+        options.nSpeed = speed;
+        options.nProfile = profile;
+        return SizeWith(FourCC("MKV "), FourCC("H264"), options);
+    };
+    EXPECT_EQ(size(0, 0), size(5, 0));
+    EXPECT_LT(size(1, 0), size(7, 0));
+    EXPECT_NE(size(5, 1), size(5, 0)) << "baseline has fewer tools";
+    EXPECT_EQ(size(8, 0), 0);
+    EXPECT_EQ(size(5, 4), 0);
 }
 
 INSTANTIATE_TEST_SUITE_P(All, Formats, testing::ValuesIn(AllPairs()), Name);
