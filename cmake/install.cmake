@@ -34,6 +34,21 @@ install_link(${CMAKE_INSTALL_LIBDIR} libmovieconv.so.${PROJECT_VERSION_MAJOR}
 install_link(${CMAKE_INSTALL_LIBDIR} libmovieconv.so ${home_dir}/libmovieconv.so)
 
 install(FILES host/terminal/movieconv.1 DESTINATION ${CMAKE_INSTALL_MANDIR}/man1)
+
+# What shells need to complete the program's options, written by the program itself.
+set(completion_dir ${CMAKE_BINARY_DIR}/completion)
+file(MAKE_DIRECTORY ${completion_dir})
+add_custom_command(OUTPUT ${completion_dir}/movieconv ${completion_dir}/_movieconv ${completion_dir}/movieconv.fish
+  COMMAND movieconv_host --completion bash > ${completion_dir}/movieconv
+  COMMAND movieconv_host --completion zsh > ${completion_dir}/_movieconv
+  COMMAND movieconv_host --completion fish > ${completion_dir}/movieconv.fish
+  DEPENDS movieconv_host VERBATIM)
+add_custom_target(completion ALL DEPENDS ${completion_dir}/movieconv)
+set(share_dir ${CMAKE_INSTALL_DATAROOTDIR})
+install(FILES ${completion_dir}/movieconv DESTINATION ${share_dir}/bash-completion/completions)
+install(FILES ${completion_dir}/_movieconv DESTINATION ${share_dir}/zsh/site-functions)
+install(FILES ${completion_dir}/movieconv.fish DESTINATION ${share_dir}/fish/vendor_completions.d)
+
 include(cmake/documents.cmake)
 install(DIRECTORY ${document_dir}/ DESTINATION ${doc_dir})
 install(FILES LICENSE DESTINATION ${doc_dir} RENAME copyright)

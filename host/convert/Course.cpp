@@ -2,6 +2,7 @@
 
 #include "host/convert/Amounts.h"
 #include "host/convert/CarryOver.h"
+#include "host/convert/CodecPlan.h"
 #include "host/convert/EncodePlan.h"
 #include "host/convert/Room.h"
 #include "text/Path.h"
@@ -58,7 +59,7 @@ Verdict Course::Run() {
     observer_.Started({request_.input, request_.output, length_, lengthKnown});
     for (const NotCarried& left : CarryOver(movie_, ChooseFormat(request_), watch_.OptionSet()))
         observer_.LeftBehind(left);
-    if (lengthKnown || request_.length)
+    if ((lengthKnown || request_.length) && HasRates(request_, ChooseFormat(request_), movie_.Info()))
         WarnOfSmallRoom();
     clock_.Skip(Now());
     RunEngine(request_.begin, request_.length.value_or(0));

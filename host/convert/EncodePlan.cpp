@@ -1,5 +1,6 @@
 #include "host/convert/EncodePlan.h"
 
+#include "host/convert/CodecPlan.h"
 #include "host/convert/Failure.h"
 #include "host/convert/Formats.h"
 #include "writer/WriterStatus.h"
@@ -12,22 +13,42 @@ namespace {
 
 constexpr double kHighestFrameRate = 200; // of the output: from a source of more the engine makes 30
 
-uint32_t FindCarried(uint32_t asked, const FileFormatInfo& format, bool forSound) {
-    const uint32_t code = MWFindCodec(format.fccFormat, asked, forSound ? 1 : 0);
-    if (code == 0) {
-        throw Failure(Category::kRequest,
-                      fmt::format("{} cannot carry {} as \"{}\"", format.szName,
-                                  forSound ? "sound" : "pictures", CodeName(asked)),
-                      Reason::kCodec);
-    }
-    return code;
-}
-
-/// The usual codec if the format carries it, or the format's first.
+/// The engine's usual codec if the format carries it, or the format's first.
 template <std::size_t N>
 uint32_t UsualCodec(uint32_t usual, const uint32_t (&carried)[N]) {
     const bool carriesUsual = std::find(std::begin(carried), std::end(carried), usual) != std::end(carried);
     return carriesUsual || carried[0] == 0 ? usual : carried[0];
+}
+
+void PutPictures(EncodeParam& param, const FileFormatInfo& format, const Request& request,
+                 const PictureStreamInfo& source) {
+    const PicturePlan plan = PlanPictures(request, format, source);
+    param.fccVideo = plan.codec.value_or(UsualCodec(param.fccVideo, format.fccVideoCodecs));
+    if (plan.size) {
+        param.nWidth = plan.size->width;
+        param.nHeight = plan.size->height;
+    }
+    param.bResize = request.fit == Fit::kStretch ? 1 : 0;
+    if (plan.frameRate) // no reference to the record's double, which lies on a 4-byte boundary
+        param.dFrameRate = *plan.frameRate;
+    else if ((MWGetFormatTraits(format.fccFormat) & kWriterFormatSteadyRate) != 0 &&
+             source.frameRate <= kHighestFrameRate)
+        param.dFrameRate = std::min(source.peakRate, kHighestFrameRate);
+    param.nVideoBitrate = plan.rate.value_or(param.nVideoBitrate);
+    param.nVideoMaxBitrate = plan.maxRate.value_or(0);
+    param.nVideoRateMode = plan.maxRate ? 1 : 0;
+}
+
+void PutSound(EncodeParam& param, const FileFormatInfo& format, const Request& request,
+              const SoundStreamInfo& source) {
+    const SoundPlan plan = PlanSound(request, format, source);
+    param.fccAudio = plan.codec.value_or(UsualCodec(param.fccAudio, format.fccAudioCodecs));
+    param.nChannels = plan.channels.value_or(param.nChannels);
+    param.nSampleRate = plan.sampleRate.value_or(param.nSampleRate);
+    param.nAudioBitrate = plan.rate.value_or(param.nAudioBitrate);
+    param.nAudioMaxBitrate = plan.maxRate.value_or(0);
+    param.nAudioRateMode = plan.maxRate ? 1 : 0;
+    param.nBitsPerSample = source.bitsPerSample;
 }
 
 } // namespace
@@ -35,6 +56,8 @@ uint32_t UsualCodec(uint32_t usual, const uint32_t (&carried)[N]) {
 const FileFormatInfo& ChooseFormat(const Request& request) {
     const FileFormatInfo* format =
         request.format ? FindFormat(CodeName(*request.format)) : FindFormatOfFile(request.output);
+    if (format == nullptr && !request.format && request.preferences.format)
+        format = FindFormat(CodeName(*request.preferences.format));
     if (format == nullptr && request.format) {
         throw Failure(Category::kRequest,
                       fmt::format("there is no file format \"{}\"", CodeName(*request.format)),
@@ -45,10 +68,8 @@ const FileFormatInfo& ChooseFormat(const Request& request) {
                       fmt::format("the extension of \"{}\" tells no file format", request.output),
                       Reason::kNoFormat);
     }
-    if (request.videoCodec)
-        FindCarried(*request.videoCodec, *format, false);
-    if (request.audioCodec)
-        FindCarried(*request.audioCodec, *format, true);
+    ChooseVideoCodec(request, *format);
+    ChooseAudioCodec(request, *format);
     return *format;
 }
 
@@ -56,30 +77,10 @@ EncodeParam PlanEncoding(const EncodeParam& defaults, const FileFormatInfo& form
                          const SourceInfo& source) {
     EncodeParam param = defaults;
     param.fccFileFormat = format.fccFormat;
-    param.fccVideo = request.videoCodec ? FindCarried(*request.videoCodec, format, false)
-                                        : UsualCodec(param.fccVideo, format.fccVideoCodecs);
-    param.fccAudio = request.audioCodec ? FindCarried(*request.audioCodec, format, true)
-                                        : UsualCodec(param.fccAudio, format.fccAudioCodecs);
-    if (request.size) {
-        param.nWidth = request.size->width;
-        param.nHeight = request.size->height;
-    }
-    param.bResize = request.fit == Fit::kStretch ? 1 : 0;
-    if (request.frameRate) // no reference to the record's double, which lies on a 4-byte boundary
-        param.dFrameRate = *request.frameRate;
-    else if (source.pictures && (MWGetFormatTraits(format.fccFormat) & kWriterFormatSteadyRate) != 0 &&
-             source.pictures->frameRate <= kHighestFrameRate)
-        param.dFrameRate = std::min(source.pictures->peakRate, kHighestFrameRate);
-    param.nVideoBitrate = request.videoRate.value_or(param.nVideoBitrate);
-    param.nVideoMaxBitrate = request.videoMaxRate.value_or(0);
-    param.nVideoRateMode = request.videoMaxRate ? 1 : 0;
-    param.nChannels = request.channels.value_or(param.nChannels);
-    param.nSampleRate = request.sampleRate.value_or(param.nSampleRate);
-    param.nAudioBitrate = request.audioRate.value_or(param.nAudioBitrate);
-    param.nAudioMaxBitrate = request.audioMaxRate.value_or(0);
-    param.nAudioRateMode = request.audioMaxRate ? 1 : 0;
+    if (source.pictures)
+        PutPictures(param, format, request, *source.pictures);
     if (source.sound)
-        param.nBitsPerSample = source.sound->bitsPerSample;
+        PutSound(param, format, request, *source.sound);
     param.bNoVideo = source.pictures && format.bHasVideo != 0 ? 0 : 1;
     param.bNoAudio = source.sound && format.bHasAudio != 0 ? 0 : 1;
     if (param.bNoVideo != 0 && param.bNoAudio != 0) {

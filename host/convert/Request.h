@@ -2,6 +2,7 @@
 #ifndef MOVIECONV_HOST_CONVERT_REQUEST_H
 #define MOVIECONV_HOST_CONVERT_REQUEST_H
 
+#include "host/convert/Preferences.h"
 #include "host/source/Deinterlace.h"
 
 #include <chrono>
@@ -17,12 +18,8 @@ enum class OnFull { kStop, kWait };
 /// How pictures of another shape fill the output's: distorted, or with black borders.
 enum class Fit { kStretch, kBorders };
 
-struct Size {
-    int32_t width;
-    int32_t height;
-};
-
-/// Names are bytes as the system has them. What is not given is left to the engine's defaults and the source.
+/// Names are bytes as the system has them. What is not given is left to the preferences, then to the engine's
+/// defaults and the source.
 struct Request {
     std::string input;
     std::string output;
@@ -33,8 +30,11 @@ struct Request {
     std::optional<uint32_t> audioCodec;
     std::optional<Size> size;
     Fit fit = Fit::kBorders;
-    std::optional<double> frameRate;     ///< Pictures per second, up to 200.
-    std::optional<int32_t> videoRate;    ///< Bits per second.
+    std::optional<double> frameRate; ///< Pictures per second, up to 200.
+    /// Constant quality on the codec's own scale, less is better, instead of a bit rate.
+    std::optional<double> quality;
+    std::optional<Speed> speed;
+    std::optional<int32_t> videoRate;    ///< Bits per second, instead of a constant quality.
     std::optional<int32_t> videoMaxRate; ///< Makes videoRate a target.
     std::optional<int32_t> audioRate;
     std::optional<int32_t> audioMaxRate;
@@ -44,6 +44,7 @@ struct Request {
     bool noVideo = false;
     bool noAudio = false;
     bool playlists = false; ///< The input may be a playlist, which names movies in its folder and below.
+    Preferences preferences;
 
     double begin = 0;             ///< Seconds.
     std::optional<double> length; ///< Seconds, at least 0.001; by default all the rest.

@@ -1,5 +1,6 @@
 #include "host/convert/Room.h"
 
+#include "host/convert/CodecPlan.h"
 #include "host/convert/EncodePlan.h"
 #include "host/convert/Engine.h"
 #include "host/convert/Failure.h"
@@ -30,7 +31,8 @@ Room EstimateRoom(const Request& request) {
     EncodeParam param{};
     MCGetEncodeParam(engine.get(), &param);
     const std::string folder = text::FolderOf(request.output);
-    return {length, MCGetEstimateDiskSpaceEx(&param, length), folder, FreeBytes(folder)};
+    const bool known = HasRates(request, ChooseFormat(request), movie.Info());
+    return {length, known ? MCGetEstimateDiskSpaceEx(&param, length) : -1, folder, FreeBytes(folder)};
 }
 
 } // namespace movieconv

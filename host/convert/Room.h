@@ -14,7 +14,7 @@ int64_t FreeBytes(const std::string& folder);
 
 struct Room {
     double length;      ///< Seconds to convert.
-    int64_t needed;     ///< Bytes that they are going to take, about.
+    int64_t needed;     ///< Bytes that they are going to take, about; -1 when quality decides it.
     std::string folder; ///< The output's.
     int64_t free;       ///< Bytes free there; -1 when it cannot be told.
 };

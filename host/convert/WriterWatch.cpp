@@ -1,5 +1,7 @@
 #include "host/convert/WriterWatch.h"
 
+#include "host/convert/CodecPlan.h"
+#include "host/convert/EncodePlan.h"
 #include "host/convert/Room.h"
 #include "text/Path.h"
 
@@ -41,6 +43,13 @@ WriterWatch::WriterWatch(const Request& request, const SourceInfo& source, Bell&
         writer.nColorPrimaries = IsHdr(pictures) ? kBt709 : pictures.colorPrimaries;
         writer.nColorTransfer = IsHdr(pictures) ? kBt709 : pictures.colorTransfer;
         writer.nColorMatrix = IsHdr(pictures) ? kBt709 : pictures.colorMatrix;
+    }
+    if (const FileFormatInfo& format = ChooseFormat(request); source.pictures && format.bHasVideo != 0) {
+        const PicturePlan plan = PlanPictures(request, format, *source.pictures);
+        writer.bQuality = plan.quality ? 1 : 0;
+        writer.dQuality = plan.quality.value_or(0);
+        writer.nSpeed = plan.speed ? static_cast<int32_t>(*plan.speed) : 0;
+        writer.nProfile = plan.profile ? static_cast<int32_t>(*plan.profile) : 0;
     }
     writer.bKeepExisting = request.overwrite ? 0 : 1;
     writer.bRemovePartial = request.keepPartial ? 0 : 1;

@@ -1,8 +1,6 @@
 #include "host/terminal/Describe.h"
 
 #include "host/convert/Amounts.h"
-#include "host/convert/Formats.h"
-#include "media/MediaWriter.h"
 
 #include <cmath>
 #include <fmt/format.h>
@@ -134,24 +132,6 @@ std::string DescribeConverted(const SourceInfo& source) {
     return fmt::format("pictures:  {}\nsound:     {}\n", number(source.pictures), number(source.sound));
 }
 
-template <std::size_t N>
-std::string CodecList(const uint32_t (&codes)[N]) {
-    std::string list;
-    for (const uint32_t code : codes) {
-        if (code == 0)
-            break;
-        list += (list.empty() ? "" : ", ") + CodeName(code);
-    }
-    return list.empty() ? "none" : list;
-}
-
-/// "mp4,m4v" as ".mp4, .m4v".
-std::string ExtensionList(std::string list) {
-    for (std::size_t comma = list.find(','); comma != std::string::npos; comma = list.find(',', comma + 1))
-        list.replace(comma, 1, ", .");
-    return "." + list;
-}
-
 } // namespace
 
 std::string Describe(const SourceInfo& source) {
@@ -167,20 +147,6 @@ std::string Describe(const SourceInfo& source) {
     text += source.tags.empty() ? "" : "tags:\n";
     for (const Tag& tag : source.tags)
         text += fmt::format("      {}: {}\n", tag.key, tag.value);
-    return text;
-}
-
-std::string ListFormats() {
-    std::string text;
-    for (const FileFormatInfo* format = MWGetFileFormatInfos(); format != nullptr && format->fccFormat != 0;
-         ++format) {
-        text += fmt::format("{:<5} {} ({})\n", CodeName(format->fccFormat), format->szName,
-                            ExtensionList(format->szExtensions));
-        if (format->bHasVideo != 0)
-            text += fmt::format("      pictures: {}\n", CodecList(format->fccVideoCodecs));
-        if (format->bHasAudio != 0)
-            text += fmt::format("      sound:    {}\n", CodecList(format->fccAudioCodecs));
-    }
     return text;
 }
 

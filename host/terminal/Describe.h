@@ -1,4 +1,4 @@
-// What --info and --list-formats print.
+// What --info prints.
 #ifndef MOVIECONV_HOST_TERMINAL_DESCRIBE_H
 #define MOVIECONV_HOST_TERMINAL_DESCRIBE_H
 
@@ -13,9 +13,6 @@ std::string Describe(const SourceInfo& source);
 
 /// The same as one JSON object in one line, as docs/progress-json.md describes it.
 std::string DescribeAsJson(const SourceInfo& source);
-
-/// The table of file formats and codecs.
-std::string ListFormats();
 
 } // namespace movieconv
 

@@ -3,13 +3,16 @@
 #include "Common/Image/ImageConvert.h"
 #include "host/convert/Failure.h"
 #include "host/convert/Formats.h"
-#include "host/terminal/Units.h"
+#include "host/presets/Notation.h"
+#include "host/presets/Preset.h"
+#include "host/terminal/Help.h"
 
 #include <CLI/CLI.hpp>
 #include <cstdio>
 #include <cstdlib>
 #include <fmt/format.h>
 #include <map>
+#include <utility>
 
 namespace movieconv {
 namespace {
@@ -30,8 +33,8 @@ CLI::Option* AddParsed(CLI::App& app, const std::string& names,
     return app.add_option_function<std::string>(names, take, help);
 }
 
-template <class Value>
-CLI::Option* AddChoice(CLI::App& app, const std::string& name, Value& target,
+template <class Value, class Target>
+CLI::Option* AddChoice(CLI::App& app, const std::string& name, Target& target,
                        const std::map<std::string, Value>& choices, const std::string& help) {
     std::string list;
     for (const auto& [word, value] : choices)
@@ -45,6 +48,14 @@ CLI::Option* AddChoice(CLI::App& app, const std::string& name, Value& target,
     return app.add_option_function<std::string>(name, take, help)->type_name(list);
 }
 
+std::map<std::string, Speed> SpeedChoices() {
+    std::map<std::string, Speed> choices;
+    int number = 0;
+    for (const std::string_view name : kSpeedNames)
+        choices.emplace(name, static_cast<Speed>(++number));
+    return choices;
+}
+
 std::optional<uint32_t> ParseFormat(std::string_view name) {
     const FileFormatInfo* format = FindFormat(name);
     return format != nullptr ? std::optional(format->fccFormat) : std::nullopt;
@@ -52,6 +63,10 @@ std::optional<uint32_t> ParseFormat(std::string_view name) {
 
 void AddEncoding(CLI::App& app, Options& options) {
     const std::string group = "Format and codecs";
+    app.add_option("--preset", options.preset,
+                   "What is not told by other options, by name or from a\nJSON file (default standard)")
+        ->type_name("PRESET")
+        ->group(group);
     AddParsed(app, "-f,--format", ParseFormat, options.request.format,
               "a file format; see \"movieconv --list-formats\"",
               "File format, by code or extension; by default the\noutput's extension tells")
@@ -91,8 +106,18 @@ void AddPictures(CLI::App& app, Options& options) {
               "Pictures per second; by default the source's")
         ->type_name("N")
         ->group(group);
+    app.add_option("--quality", options.request.quality,
+                   "Constant quality on the codec's scale, less is better;\nby default the preset's")
+        ->check(CLI::Range(0.0, 63.0).description(""))
+        ->type_name("N")
+        ->group(group);
+    AddChoice<Speed>(app, "--speed", options.request.speed, SpeedChoices(),
+                     "How long the encoder looks for a smaller file")
+        ->type_name("SPEED")
+        ->group(group);
     AddParsed(app, "--video-rate", ParseRate, options.request.videoRate,
-              "a bit rate up to 2147M, such as 512k or 1.5M", "Bits per second, as 1.5M (default 512k)")
+              "a bit rate up to 2147M, such as 512k or 1.5M",
+              "Bits per second, as 1.5M, instead of a quality")
         ->type_name("RATE")
         ->group(group);
     AddParsed(app, "--video-max-rate", ParseRate, options.request.videoMaxRate,
@@ -112,7 +137,7 @@ void AddSound(CLI::App& app, Options& options) {
         ->type_name("HZ")
         ->group(group);
     AddParsed(app, "--audio-rate", ParseRate, options.request.audioRate,
-              "a bit rate up to 2147M, such as 128k", "Bits per second (default 128k)")
+              "a bit rate up to 2147M, such as 128k", "Bits per second, as 128k; by default the preset's")
         ->type_name("RATE")
         ->group(group);
     AddParsed(app, "--audio-max-rate", ParseRate, options.request.audioMaxRate,
@@ -184,29 +209,51 @@ void AddReports(CLI::App& app, Options& options) {
     task("--info", Task::kInfo, "Tell what INPUT is");
     task("--estimate", Task::kEstimate, "Tell how much room the output needs and what there is");
     task("--list-formats", Task::kListFormats, "List file formats and codecs");
+    task("--list-presets", Task::kListPresets, "List presets; with --quiet their names");
+    app.add_option_function<std::string>(
+           "--show-preset",
+           [&](const std::string& name) {
+               options.task = Task::kShowPreset;
+               options.preset = name;
+           },
+           "Print a preset with all that its parents say")
+        ->type_name("PRESET")
+        ->group("Instead of converting");
+    AddChoice<Shell>(app, "--completion", options.completion,
+                     {{"bash", Shell::kBash}, {"zsh", Shell::kZsh}, {"fish", Shell::kFish}},
+                     "Print a script by which that shell completes these\noptions")
+        ->group("Instead of converting");
 }
 
-/// Formats the usage line as a reader expects it; the library's own lists every positional's type.
-class HelpFormatter : public CLI::Formatter {
-public:
-    std::string make_usage(const CLI::App* /*app*/, std::string /*name*/) const override {
-        return "Usage: movieconv [OPTIONS] INPUT OUTPUT\n";
-    }
-};
-
 void RequireNames(const Options& options) {
-    const bool needsInput = options.task != Task::kListFormats;
     const bool needsOutput = options.task == Task::kConvert || options.task == Task::kEstimate;
+    const bool needsInput = needsOutput || options.task == Task::kInfo;
     if (needsInput && options.request.input.empty())
         throw Failure(Category::kRequest, "INPUT is missing; try \"movieconv --help\"");
     if (needsOutput && options.request.output.empty())
         throw Failure(Category::kRequest, "OUTPUT is missing; try \"movieconv --help\"");
     if (options.request.noVideo && options.request.noAudio)
         throw Failure(Category::kRequest, "--no-video and --no-audio together leave nothing to convert");
+    if (options.request.quality && options.request.videoRate)
+        throw Failure(Category::kRequest, "--quality and --video-rate exclude each other");
     if (options.request.length && *options.request.length < 0.001)
         throw Failure(Category::kRequest, "--length must be at least 0.001 seconds");
     if (options.request.split && (*options.request.split < 0.1 || *options.request.split > 2'000'000))
         throw Failure(Category::kRequest, "--split takes from 0.1 to 2000000 seconds");
+}
+
+/// What the preset says, where the other options do not say otherwise.
+void ApplyPreset(Options& options) {
+    try {
+        Preset preset = LoadPreset(options.preset);
+        Request& request = options.request;
+        request.noVideo = request.noVideo || (preset.preferences.noVideo && !request.videoCodec);
+        request.noAudio = request.noAudio || (preset.preferences.noAudio && !request.audioCodec);
+        request.preferences = std::move(preset.preferences);
+        options.complaints = std::move(preset.complaints);
+    } catch (const PresetError& error) {
+        throw Failure(Category::kRequest, error.what());
+    }
 }
 
 /// The version, and what a report of a fault should say of the processor.
@@ -225,13 +272,12 @@ std::optional<Options> ParseOptions(int argc, char** argv) {
     Options options;
     CLI::App app{"Converts a movie to another format, picture size or codec, as one file or as\nclips.",
                  "movieconv"};
-    app.formatter(std::make_shared<HelpFormatter>());
-    app.get_formatter()->column_width(26);
+    app.formatter(MakeHelpFormatter());
     app.footer("A name that begins with a dash goes behind \"--\". While converting, space or p\n"
                "pauses and resumes, q or Ctrl-C stops and keeps what is done as a playable file.\n"
-               "Exit codes: 0 done, 1 internal, 2 usage, 3 cannot read the source, 4 cannot\n"
-               "write the output, 5 no space, 6 stopped. See movieconv(1).");
-    app.set_help_flag("-h,--help", "Print this help")->group("Instead of converting");
+               "movieconv(1) tells more, with the presets and the exit codes.");
+    app.set_help_flag("-h,--help", "Print help on the usual options")->group("Instead of converting");
+    app.set_help_all_flag("--help-all", "Print help on all options")->group("Instead of converting");
     app.set_version_flag("--version", Version, "Print the version and the colour routines' level")
         ->group("Instead of converting");
     app.add_option("INPUT", options.request.input, "The movie to convert, any that FFmpeg can read")
@@ -251,7 +297,13 @@ std::optional<Options> ParseOptions(int argc, char** argv) {
     } catch (const CLI::ParseError& error) {
         throw Failure(Category::kRequest, fmt::format("{}; try \"movieconv --help\"", error.what()));
     }
+    if (options.completion) {
+        std::fputs(CompletionScript(*options.completion, OptionEntries(app)).c_str(), stdout);
+        return std::nullopt;
+    }
     RequireNames(options);
+    if (options.task == Task::kConvert || options.task == Task::kEstimate)
+        ApplyPreset(options);
     if (options.preview)
         options.request.preview = kPreviewInterval;
     return options;

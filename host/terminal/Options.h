@@ -3,27 +3,34 @@
 #define MOVIECONV_HOST_TERMINAL_OPTIONS_H
 
 #include "host/convert/Request.h"
+#include "host/presets/Preset.h"
+#include "host/terminal/Completion.h"
 
 #include <optional>
 #include <string>
+#include <vector>
 
 namespace movieconv {
 
-enum class Task { kConvert, kInfo, kEstimate, kListFormats };
+enum class Task { kConvert, kInfo, kEstimate, kListFormats, kListPresets, kShowPreset };
 enum class ProgressStyle { kBar, kJson, kNone };
+
 /// Names are bytes as the system has them.
 struct Options {
     Task task = Task::kConvert;
-    Request request;
+    Request request; ///< With the preset's preferences.
+    std::string preset = kStandardPreset;
+    std::vector<std::string> complaints; ///< Of the preset.
 
     std::optional<std::string> log;
     bool quiet = false;
     std::optional<std::string> preview;
     ProgressStyle progress = ProgressStyle::kBar;
+    std::optional<Shell> completion;
 };
 
-/// Reads the command line. Prints help or the version to standard output and returns nothing when that was
-/// all that was asked for. Throws Failure when the command line makes no sense.
+/// Reads the command line. Prints help, the version or a shell's script to standard output and returns
+/// nothing when that was all that was asked for. Throws Failure when the command line makes no sense.
 std::optional<Options> ParseOptions(int argc, char** argv);
 
 } // namespace movieconv

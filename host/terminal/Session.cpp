@@ -36,6 +36,8 @@ void Session::Started(const Start& news) {
     if (options_.preview)
         preview_.emplace(*options_.preview, options_.request.overwrite);
     reporter_->Started(news);
+    for (const std::string& complaint : options_.complaints)
+        reporter_->Warn(complaint);
     control_.Arm(options_.progress == ProgressStyle::kBar && !options_.quiet,
                  [this](Command command) { Obey(command); });
 }

@@ -1,8 +1,10 @@
 #include "host/convert/Amounts.h"
 #include "host/convert/Room.h"
 #include "host/convert/Sources.h"
+#include "host/presets/Preset.h"
 #include "host/terminal/ControlInput.h"
 #include "host/terminal/Describe.h"
+#include "host/terminal/Listings.h"
 #include "host/terminal/MainLoop.h"
 #include "host/terminal/Options.h"
 #include "host/terminal/Session.h"
@@ -11,6 +13,7 @@
 
 #include <cerrno>
 #include <cstdio>
+#include <cstdlib>
 #include <cstring>
 #include <exception>
 #include <fcntl.h>
@@ -25,6 +28,12 @@ namespace {
 
 void LimitHeap() {
     mallopt(M_ARENA_MAX, 1); // heaps of their own for the dozen threads cost 20 MB and save no time
+}
+
+/// The AV1 encoder writes to standard error by itself, and takes this as its only way to be told not to.
+void SilenceEncoders() {
+    constexpr int kUnlessSet = 0;
+    setenv("SVT_LOG", "0", kUnlessSet);
 }
 
 /// Descriptors that the caller closed would be given to files and be written to as standard streams.
@@ -45,8 +54,12 @@ void PrintWhole(const StandardStreams& streams, const std::string& text) {
 
 ExitCode Estimate(const Options& options, const StandardStreams& streams) {
     const Room room = EstimateRoom(options.request);
-    PrintWhole(streams, fmt::format("needs about {} for {} of output\n", FormatBytes(room.needed),
-                                    FormatTime(room.length, true)));
+    PrintWhole(streams,
+               room.needed < 0
+                   ? fmt::format("how much {} of output need is unknown: the quality decides, not a rate\n",
+                                 FormatTime(room.length, true))
+                   : fmt::format("needs about {} for {} of output\n", FormatBytes(room.needed),
+                                 FormatTime(room.length, true)));
     if (room.free < 0) {
         throw Failure(Category::kOutput,
                       fmt::format("the output's folder \"{}\" cannot be used", room.folder));
@@ -55,11 +68,29 @@ ExitCode Estimate(const Options& options, const StandardStreams& streams) {
     return room.needed <= room.free ? ExitCode::kDone : ExitCode::kNoSpace;
 }
 
+/// Its text; what is odd about it goes to standard error.
+std::string ShowPreset(const std::string& name, const StandardStreams& streams) {
+    try {
+        const Preset preset = LoadPreset(name);
+        for (const std::string& complaint : preset.complaints)
+            streams.PrintError(fmt::format("movieconv: warning: {}\n", complaint));
+        return preset.text;
+    } catch (const PresetError& error) {
+        throw Failure(Category::kRequest, error.what());
+    }
+}
+
 ExitCode Perform(const Options& options, const StandardStreams& streams, MainLoop& loop,
                  ControlInput& control) {
     switch (options.task) {
     case Task::kListFormats:
-        PrintWhole(streams, ListFormats());
+        PrintWhole(streams, options.progress == ProgressStyle::kJson ? FormatsJson() : FormatsText());
+        return ExitCode::kDone;
+    case Task::kListPresets:
+        PrintWhole(streams, options.quiet ? PresetNames() : PresetsText());
+        return ExitCode::kDone;
+    case Task::kShowPreset:
+        PrintWhole(streams, ShowPreset(options.preset, streams) + "\n");
         return ExitCode::kDone;
     case Task::kInfo: {
         const SourceInfo source = LookAtSource(options.request);
@@ -99,6 +130,7 @@ void Tell(const Failure& failure) {
 
 int main(int argc, char** argv) {
     movieconv::LimitHeap();
+    movieconv::SilenceEncoders();
     movieconv::OpenStandardDescriptors();
     try {
         return movieconv::Main(argc, argv);

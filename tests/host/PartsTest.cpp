@@ -1,9 +1,9 @@
 #include "host/convert/Amounts.h"
 #include "host/convert/SpeedMeter.h"
 #include "host/convert/WorkClock.h"
+#include "host/presets/Notation.h"
 #include "host/terminal/JsonReporter.h"
 #include "host/terminal/TextReporter.h"
-#include "host/terminal/Units.h"
 
 #include <gtest/gtest.h>
 

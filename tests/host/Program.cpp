@@ -1,5 +1,6 @@
 #include "tests/host/Program.h"
 
+#include <algorithm>
 #include <csignal>
 #include <cstdio>
 #include <cstdlib>
@@ -24,6 +25,11 @@ namespace {
 }
 
 std::vector<std::string> Movieconv(std::vector<std::string> arguments) {
+    const bool convertsByItself =
+        std::none_of(arguments.begin(), arguments.end(),
+                     [](const std::string& one) { return one == "--preset" || one == "--show-preset"; });
+    if (convertsByItself && !arguments.empty())
+        arguments.insert(arguments.begin(), {"--preset", "classic"});
     arguments.insert(arguments.begin(), MOVIECONV_PROGRAM);
     return arguments;
 }

@@ -1,4 +1,4 @@
-#include "host/terminal/Units.h"
+#include "host/presets/Notation.h"
 
 #include <algorithm>
 #include <charconv>

@@ -1,8 +1,8 @@
-// The notations of the command line: times, bit rates, picture sizes.
-#ifndef MOVIECONV_HOST_TERMINAL_UNITS_H
-#define MOVIECONV_HOST_TERMINAL_UNITS_H
+// The notations of the command line and of presets: times, bit rates, picture sizes.
+#ifndef MOVIECONV_HOST_PRESETS_NOTATION_H
+#define MOVIECONV_HOST_PRESETS_NOTATION_H
 
-#include "host/convert/Request.h"
+#include "host/convert/Preferences.h"
 
 #include <cstdint>
 #include <optional>

@@ -1,0 +1,151 @@
+#include "host/convert/CodecPlan.h"
+
+#include "host/convert/Failure.h"
+#include "host/convert/Formats.h"
+#include "media/FourCC.h"
+#include "writer/WriterStatus.h"
+
+#include <algorithm>
+#include <cmath>
+#include <fmt/format.h>
+#include <string>
+#include <vector>
+
+namespace movieconv {
+namespace {
+
+std::string NamesOf(const std::vector<uint32_t>& codes) {
+    std::string names;
+    for (const uint32_t code : codes)
+        names += (names.empty() ? "" : ", ") + CodeName(code);
+    return names;
+}
+
+std::optional<uint32_t> ChooseCodec(const std::optional<uint32_t>& asked,
+                                    const std::vector<uint32_t>& preferred, const FileFormatInfo& format,
+                                    bool forSound) {
+    const std::vector<uint32_t> wanted = asked ? std::vector{*asked} : preferred;
+    for (const uint32_t code : wanted)
+        if (const uint32_t carried = MWFindCodec(format.fccFormat, code, forSound ? 1 : 0); carried != 0)
+            return carried;
+    const bool carriesAny = forSound ? format.bHasAudio != 0 : format.bHasVideo != 0;
+    if (wanted.empty() || (!asked && !carriesAny))
+        return std::nullopt;
+    throw Failure(Category::kRequest,
+                  fmt::format("{} cannot carry {} as \"{}\"", format.szName, forSound ? "sound" : "pictures",
+                              NamesOf(wanted)),
+                  Reason::kCodec);
+}
+
+/// The codec that the engine takes by itself where the format carries it, or the format's first.
+uint32_t UsualVideoCodec(const FileFormatInfo& format) {
+    const uint32_t carried = MWFindCodec(format.fccFormat, FourCC("XVID"), 0);
+    return carried != 0 ? carried : format.fccVideoCodecs[0];
+}
+
+/// The source's size made smaller, in its shape, until it fits; nothing when it fits.
+std::optional<Size> FitWithin(const PictureStreamInfo& source, const Size& bounds) {
+    const double factor = std::min(bounds.width / static_cast<double>(source.width),
+                                   bounds.height / static_cast<double>(source.height));
+    if (source.width <= 0 || source.height <= 0 || factor >= 1)
+        return std::nullopt;
+    const auto even = [](double length) {
+        return std::max<int32_t>(2, static_cast<int32_t>(std::lround(length / 2)) * 2);
+    };
+    return Size{std::min(even(source.width * factor), bounds.width),
+                std::min(even(source.height * factor), bounds.height)};
+}
+
+std::optional<double> PreferredQuality(const Preferences& preferences, uint32_t codec, int height) {
+    for (const uint32_t key : {codec, uint32_t{0}}) // one of no codec is for all
+        if (const auto found = preferences.quality.find(key); found != preferences.quality.end())
+            return found->second.At(height);
+    return std::nullopt;
+}
+
+/// Throws Failure when the codec has no scale or another one.
+void RequireQuality(uint32_t codec, double quality) {
+    double best = 0;
+    double worst = 0;
+    if (MWGetQualityScale(codec, &best, &worst) == 0) {
+        throw Failure(Category::kRequest,
+                      fmt::format("\"{}\" has no constant quality; give it a bit rate", CodeName(codec)));
+    }
+    if (quality < best || quality > worst) {
+        throw Failure(Category::kRequest,
+                      fmt::format("the quality of \"{}\" goes from {} (best) to {}, not to {}",
+                                  CodeName(codec), best, worst, quality));
+    }
+}
+
+/// One of rate and quality, and whatever is asked for wins over what is preferred.
+void PlanRate(PicturePlan& plan, const Request& request, int height) {
+    const Preferences& preferences = request.preferences;
+    plan.maxRate = request.videoMaxRate ? request.videoMaxRate : preferences.videoMaxRate;
+    if (request.videoRate) {
+        plan.rate = request.videoRate;
+    } else if (plan.codec) {
+        plan.quality = request.quality ? request.quality : PreferredQuality(preferences, *plan.codec, height);
+        if (plan.quality)
+            RequireQuality(*plan.codec, *plan.quality);
+    }
+    if (!plan.quality && !plan.rate)
+        plan.rate = preferences.videoRate;
+}
+
+} // namespace
+
+std::optional<uint32_t> ChooseVideoCodec(const Request& request, const FileFormatInfo& format) {
+    return ChooseCodec(request.videoCodec, request.preferences.videoCodecs, format, false);
+}
+
+std::optional<uint32_t> ChooseAudioCodec(const Request& request, const FileFormatInfo& format) {
+    return ChooseCodec(request.audioCodec, request.preferences.audioCodecs, format, true);
+}
+
+PicturePlan PlanPictures(const Request& request, const FileFormatInfo& format,
+                         const PictureStreamInfo& source) {
+    const Preferences& preferences = request.preferences;
+    PicturePlan plan;
+    plan.codec = ChooseVideoCodec(request, format);
+    if (!plan.codec && request.quality) // which needs to know whose scale it is on
+        plan.codec = UsualVideoCodec(format);
+    plan.size = request.size;
+    if (!plan.size && preferences.fitWithin)
+        plan.size = FitWithin(source, *preferences.fitWithin);
+    plan.frameRate = request.frameRate ? request.frameRate : preferences.frameRate;
+    constexpr double kSameRate = 1.001;
+    if (!plan.frameRate && preferences.maxFrameRate &&
+        source.frameRate > *preferences.maxFrameRate * kSameRate)
+        plan.frameRate = preferences.maxFrameRate;
+    plan.speed = request.speed ? request.speed : preferences.speed;
+    plan.profile = preferences.profile;
+    PlanRate(plan, request, plan.size ? plan.size->height : source.height);
+    return plan;
+}
+
+bool HasRates(const Request& request, const FileFormatInfo& format, const SourceInfo& source) {
+    if (!source.pictures || format.bHasVideo == 0)
+        return true;
+    const PicturePlan plan = PlanPictures(request, format, *source.pictures);
+    double best = 0;
+    double worst = 0;
+    const bool lossless = plan.codec && MWGetQualityScale(*plan.codec, &best, &worst) == 0;
+    return !plan.quality && !lossless;
+}
+
+SoundPlan PlanSound(const Request& request, const FileFormatInfo& format, const SoundStreamInfo& source) {
+    const Preferences& preferences = request.preferences;
+    SoundPlan plan;
+    plan.codec = ChooseAudioCodec(request, format);
+    plan.channels = request.channels ? request.channels : preferences.channels;
+    if (!plan.channels && preferences.maxChannels && source.channels > *preferences.maxChannels)
+        plan.channels = preferences.maxChannels;
+    plan.sampleRate = request.sampleRate ? request.sampleRate : preferences.sampleRate;
+    plan.rate = request.audioRate ? request.audioRate
+                                  : preferences.audioRate.At(plan.channels.value_or(source.channels));
+    plan.maxRate = request.audioMaxRate;
+    return plan;
+}
+
+} // namespace movieconv

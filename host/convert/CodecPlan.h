@@ -1,0 +1,49 @@
+// How pictures and sound are to be coded: the request, what it prefers, and what format and source allow.
+#ifndef MOVIECONV_HOST_CONVERT_CODECPLAN_H
+#define MOVIECONV_HOST_CONVERT_CODECPLAN_H
+
+#include "host/convert/Request.h"
+#include "host/source/Source.h"
+#include "media/EncodeParam.h"
+
+#include <cstdint>
+#include <optional>
+
+namespace movieconv {
+
+/// What has no value is left to the engine and the encoder.
+struct PicturePlan {
+    std::optional<uint32_t> codec;
+    std::optional<Size> size;
+    std::optional<double> frameRate;
+    std::optional<double> quality; ///< Instead of a rate.
+    std::optional<int32_t> rate;   ///< Bits per second.
+    std::optional<int32_t> maxRate;
+    std::optional<Speed> speed;
+    std::optional<Profile> profile;
+};
+
+struct SoundPlan {
+    std::optional<uint32_t> codec;
+    std::optional<int32_t> channels;
+    std::optional<int32_t> sampleRate;
+    std::optional<int32_t> rate; ///< Bits per second.
+    std::optional<int32_t> maxRate;
+};
+
+/// The codec for files of `format`, whose codes are the media writer's. Nothing where the choice is open.
+/// Throws Failure when the format cannot carry what is asked for, or nothing of what is preferred.
+std::optional<uint32_t> ChooseVideoCodec(const Request& request, const FileFormatInfo& format);
+std::optional<uint32_t> ChooseAudioCodec(const Request& request, const FileFormatInfo& format);
+
+/// Whether the size of the output follows from bit rates.
+bool HasRates(const Request& request, const FileFormatInfo& format, const SourceInfo& source);
+
+/// Throws Failure as well when the codec has no such quality.
+PicturePlan PlanPictures(const Request& request, const FileFormatInfo& format,
+                         const PictureStreamInfo& source);
+SoundPlan PlanSound(const Request& request, const FileFormatInfo& format, const SoundStreamInfo& source);
+
+} // namespace movieconv
+
+#endif

@@ -1,0 +1,115 @@
+#include "host/terminal/Listings.h"
+
+#include "host/convert/Formats.h"
+#include "host/presets/Preset.h"
+#include "media/MediaWriter.h"
+
+#include <algorithm>
+#include <fmt/format.h>
+#include <fmt/ranges.h>
+#include <iterator>
+#include <nlohmann/json.hpp>
+
+namespace movieconv {
+namespace {
+
+/// Calls `take` with each file format.
+template <class Take>
+void ForEachFormat(Take take) {
+    for (const FileFormatInfo* format = MWGetFileFormatInfos(); format != nullptr && format->fccFormat != 0;
+         ++format)
+        take(*format);
+}
+
+std::vector<std::string> Extensions(const FileFormatInfo& format) {
+    std::vector<std::string> names{""};
+    for (const char c : std::string(format.szExtensions)) {
+        if (c == ',')
+            names.emplace_back();
+        else
+            names.back() += c;
+    }
+    return names;
+}
+
+/// The codes of a list that zero or its end ends.
+template <std::size_t N>
+std::vector<std::string> Codecs(const uint32_t (&codes)[N]) {
+    std::vector<std::string> names;
+    for (const uint32_t code : codes) {
+        if (code == 0)
+            break;
+        names.push_back(CodeName(code));
+    }
+    return names;
+}
+
+} // namespace
+
+std::string FormatsText() {
+    std::string text;
+    ForEachFormat([&](const FileFormatInfo& format) {
+        const auto add = [&](const char* title, const std::vector<std::string>& codecs) {
+            if (!codecs.empty())
+                fmt::format_to(std::back_inserter(text), "      {:<9} {}\n", title, fmt::join(codecs, ", "));
+        };
+        fmt::format_to(std::back_inserter(text), "{:<5} {} (.{})\n", CodeName(format.fccFormat),
+                       format.szName, fmt::join(Extensions(format), ", ."));
+        add("pictures:", Codecs(format.fccVideoCodecs));
+        add("sound:", Codecs(format.fccAudioCodecs));
+    });
+    return text;
+}
+
+std::string FormatsJson() {
+    nlohmann::ordered_json list = nlohmann::ordered_json::array();
+    ForEachFormat([&](const FileFormatInfo& format) {
+        list.push_back({{"code", CodeName(format.fccFormat)},
+                        {"name", format.szName},
+                        {"extensions", Extensions(format)},
+                        {"pictures", Codecs(format.fccVideoCodecs)},
+                        {"sound", Codecs(format.fccAudioCodecs)}});
+    });
+    return nlohmann::ordered_json{{"v", 1}, {"event", "formats"}, {"formats", list}}.dump() + "\n";
+}
+
+std::string PresetsText() {
+    std::string text;
+    for (const PresetSummary& preset : ListPresets()) {
+        const std::string& told = preset.failure.empty() ? preset.description : preset.failure;
+        fmt::format_to(std::back_inserter(text), "{:<10} {}{}\n", preset.name, told,
+                       preset.path.empty() || !preset.failure.empty() ? ""
+                                                                      : fmt::format(" ({})", preset.path));
+    }
+    return text;
+}
+
+std::string PresetNames() {
+    std::string names;
+    for (const PresetSummary& preset : ListPresets())
+        names += preset.name + "\n";
+    return names;
+}
+
+std::vector<std::string> ExtensionNames() {
+    std::vector<std::string> names;
+    ForEachFormat([&](const FileFormatInfo& format) {
+        const std::vector<std::string> own = Extensions(format);
+        names.insert(names.end(), own.begin(), own.end());
+    });
+    return names;
+}
+
+std::vector<std::string> CodecNames(bool forSound) {
+    std::vector<std::string> names;
+    ForEachFormat([&](const FileFormatInfo& format) {
+        const std::vector<std::string> own =
+            forSound ? Codecs(format.fccAudioCodecs) : Codecs(format.fccVideoCodecs);
+        names.insert(names.end(), own.begin(), own.end());
+    });
+    std::sort(names.begin(), names.end());
+    names.erase(std::unique(names.begin(), names.end()), names.end());
+    return names;
+}
+
+} // namespace movieconv
