@@ -23,6 +23,7 @@
 #include <stdint.h>
 
 #ifdef __cplusplus
+/// In C++ a record comes with its size; in C the caller fills it in.
 #define MW_SIZE_OF(record) = sizeof(record)
 #else
 #define MW_SIZE_OF(record)
