@@ -63,6 +63,20 @@ QString FailureSentence(const Failure& failure) {
     return advice.isEmpty() ? what : what + QLatin1Char(' ') + advice;
 }
 
+/// "subtitles 3 (hdmv_pgs_subtitle, ger): MP4 cannot hold them".
+QString LineOf(const NotCarried& what) {
+    QString line = QString::fromStdString(what.kind);
+    if (what.number)
+        line += QStringLiteral(" %1").arg(*what.number);
+    QStringList details;
+    for (const std::string& detail : {what.codec, what.language})
+        if (!detail.empty())
+            details += QString::fromStdString(detail);
+    if (!details.isEmpty())
+        line += QStringLiteral(" (%1)").arg(details.join(QStringLiteral(", ")));
+    return QStringLiteral("%1: %2").arg(line, QString::fromStdString(what.reason));
+}
+
 /// Hears a job and tells a listener in the window's terms.
 class Interpreter : public Observer {
 public:
@@ -92,6 +106,7 @@ public:
         figures.bytes = progress.bytes;
         listener_->OnFigures(figures);
     }
+    void LeftBehind(const NotCarried& what) override { leftBehind_ += LineOf(what); }
     void Closed(const ClosedFile& file) override { files_.push_back(file.path); }
     void Warned(const movieconv::Warning& warning) override { listener_->OnNote(Sentence(warning.text)); }
     void Showed(const std::shared_ptr<const ShownPicture>& picture) override {
@@ -117,7 +132,7 @@ public:
 
 private:
     const std::shared_ptr<RunListener> listener_;
-    const QStringList leftBehind_;
+    QStringList leftBehind_;
     std::vector<std::string> files_;
     std::atomic<bool> stopping_{false};
 };
@@ -172,40 +187,16 @@ TrackFacts TrackOf(const StreamInfo& stream) {
     return track;
 }
 
-/// What a conversion leaves behind, a line each.
+/// The streams of which a conversion takes one alone, a line for each of the others.
 QStringList LeftBehind(const SourceInfo& info) {
     QStringList left;
     for (const StreamInfo& stream : info.streams) {
-        const bool converted = (info.pictures && stream.index == info.pictures->index) ||
-                               (info.sound && stream.index == info.sound->index);
-        if (converted)
-            continue;
         const QString line = TrackLine(TrackOf(stream));
-        switch (stream.kind) {
-        case StreamKind::kPictures:
+        if (stream.kind == StreamKind::kPictures && info.pictures && stream.index != info.pictures->index)
             left += Texts::tr("Pictures: %1").arg(line);
-            break;
-        case StreamKind::kSound:
+        else if (stream.kind == StreamKind::kSound && info.sound && stream.index != info.sound->index)
             left += Texts::tr("Sound track: %1").arg(line);
-            break;
-        case StreamKind::kSubtitles:
-            left += Texts::tr("Subtitles: %1").arg(line);
-            break;
-        case StreamKind::kCover:
-            left += Texts::tr("Cover picture");
-            break;
-        case StreamKind::kAttachment:
-            left += Texts::tr("Attached file: %1").arg(QString::fromStdString(stream.fileName));
-            break;
-        case StreamKind::kData:
-            left += Texts::tr("Data: %1").arg(line);
-            break;
-        }
     }
-    if (!info.chapters.empty())
-        left += Texts::tr("%n chapters", "", static_cast<int>(info.chapters.size()));
-    if (!info.tags.empty())
-        left += Texts::tr("Title, date and other tags");
     return left;
 }
 

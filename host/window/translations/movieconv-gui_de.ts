@@ -52,33 +52,6 @@
         <translation>Tonspur: %1</translation>
     </message>
     <message>
-        <source>Subtitles: %1</source>
-        <translation>Untertitel: %1</translation>
-    </message>
-    <message>
-        <source>Cover picture</source>
-        <translation>Titelbild</translation>
-    </message>
-    <message>
-        <source>Attached file: %1</source>
-        <translation>Angehängte Datei: %1</translation>
-    </message>
-    <message>
-        <source>Data: %1</source>
-        <translation>Daten: %1</translation>
-    </message>
-    <message numerus="yes">
-        <source>%n chapters</source>
-        <translation>
-            <numerusform>ein Kapitel</numerusform>
-            <numerusform>%n Kapitel</numerusform>
-        </translation>
-    </message>
-    <message>
-        <source>Title, date and other tags</source>
-        <translation>Titel, Datum und andere Angaben</translation>
-    </message>
-    <message>
         <source>Not carried over: %1</source>
         <translation>Nicht übernommen: %1</translation>
     </message>

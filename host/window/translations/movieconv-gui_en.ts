@@ -2,16 +2,6 @@
 <!DOCTYPE TS>
 <TS version="2.1" language="en" sourcelanguage="en">
 <context>
-    <name>ConvertRunner</name>
-    <message numerus="yes">
-        <source>%n chapters</source>
-        <translation>
-            <numerusform>one chapter</numerusform>
-            <numerusform>%n chapters</numerusform>
-        </translation>
-    </message>
-</context>
-<context>
     <name>Words</name>
     <message numerus="yes">
         <source>about %n minutes</source>

@@ -5,6 +5,7 @@
 #include "host/window/widgets/Look.h"
 #include "host/window/widgets/RangeStrip.h"
 
+#include <QApplication>
 #include <QCheckBox>
 #include <QComboBox>
 #include <QFileDialog>
@@ -430,7 +431,7 @@ void EntryPage::ShowFindings() {
     findings_->setVisible(!entry_.findings.warnings.isEmpty());
     notes_->setText(entry_.findings.notes.join(QLatin1Char('\n')));
     notes_->setVisible(!entry_.findings.notes.isEmpty());
-    QPalette colours = palette();
+    QPalette colours = QApplication::palette();
     colours.setColor(QPalette::WindowText, WarningColour(colours));
     findings_->setPalette(colours);
     colours.setColor(QPalette::WindowText, BadColour(colours));
