@@ -7,6 +7,7 @@
 #include <fmt/format.h>
 #include <new>
 #include <system_error>
+#include <utility>
 
 namespace movieconv {
 namespace {
@@ -32,7 +33,8 @@ bool LiesBelow(const fs::path& path, const fs::path& folder) {
 
 } // namespace
 
-CompanionFiles::CompanionFiles(const std::string& path, bool allowed) : source_(path), allowed_(allowed) {}
+CompanionFiles::CompanionFiles(std::string path, bool allowed)
+    : source_(std::move(path)), allowed_(allowed) {}
 
 void CompanionFiles::Guard(AVFormatContext& context) {
     context.opaque = this;
@@ -41,7 +43,7 @@ void CompanionFiles::Guard(AVFormatContext& context) {
 }
 
 std::string CompanionFiles::Permit(const std::string& url) const {
-    const auto refuse = [&](const char* reason) -> SourceError {
+    const auto refuse = [&](const char* reason) {
         return SourceError(fmt::format("it names \"{}\", {}", url, reason));
     };
     std::error_code failed;

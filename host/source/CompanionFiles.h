@@ -16,7 +16,7 @@ class CompanionFiles {
 public:
     /// For the source at `path`. Unless `allowed`, no file but the source itself is opened; otherwise also
     /// regular files in its folder and below, as they lie once all symbolic links are followed.
-    CompanionFiles(const std::string& path, bool allowed);
+    CompanionFiles(std::string path, bool allowed);
     CompanionFiles(const CompanionFiles&) = delete;
     CompanionFiles& operator=(const CompanionFiles&) = delete;
 

@@ -37,7 +37,7 @@ std::string NameIn(const std::string& rest) {
     char* token = av_get_token(&cursor, kSpaces);
     if (token == nullptr)
         throw std::bad_alloc();
-    const std::string name = token;
+    std::string name = token;
     av_free(token);
     return name;
 }
