@@ -148,7 +148,7 @@ TEST(WriterResult, AFailingWriteStopsTheConversionAndSaysWhy) {
     std::signal(SIGXFSZ, SIG_IGN);
     rlimit before{};
     getrlimit(RLIMIT_FSIZE, &before);
-    const rlimit little{20000, before.rlim_max};
+    const rlimit little{300000, before.rlim_max};
     const Folder folder;
     for (const bool stops : {true, false}) {
         TableSource source;
