@@ -32,6 +32,7 @@ enum class Reason {
 /// A failure that ends a conversion or keeps it from beginning: what, where and what to do.
 class Failure : public std::exception {
 public:
+    // cppcheck-suppress passedByValue ; moved, since copying could throw
     Failure(Category category, std::string text, Reason reason = Reason::kOther) noexcept
         : category_(category), reason_(reason), text_(std::move(text)) {}
 

@@ -328,7 +328,7 @@ TEST(ParamForFile, IsChosenByTheExtension) {
                  {L"x.mp4.mp3", FourCC("MP3 "), 0, FourCC("MP3 "), 1}};
     for (const auto& row : cases) {
         EncodeParam param;
-        std::memset(&param, 0xEE, sizeof param);
+        std::memset(static_cast<void*>(&param), 0xEE, sizeof param);
         ASSERT_EQ(MCEncodeParamForFile(row.name, &param), 1);
         EXPECT_EQ(param.fccFileFormat, row.format);
         EXPECT_EQ(param.fccVideo, row.video);
@@ -340,7 +340,7 @@ TEST(ParamForFile, IsChosenByTheExtension) {
     }
     for (const wchar_t* name : {L"mp4", L"x.mp", L"x.mp4 ", L"x.", L"x.mp4/y", L"", L"x.mp4,m4v"}) {
         EncodeParam param;
-        std::memset(&param, 0xEE, sizeof param);
+        std::memset(static_cast<void*>(&param), 0xEE, sizeof param);
         EXPECT_EQ(MCEncodeParamForFile(name, &param), 0);
         EXPECT_EQ(param.fccFileFormat, 0xEEEEEEEE);
     }
