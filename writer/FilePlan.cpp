@@ -163,7 +163,8 @@ SoundPlan MakeSoundPlan(const EncodeParam& param, const AudioFormat& source, con
 
 /// Bytes that the index of a plain file of the MP4 family takes when the movie is as long as its source; too
 /// few when it gets longer.
-int64_t IndexSize(const FilePlan& plan, const VideoFormat* video, const AudioFormat* audio) {
+int64_t IndexSize(const FilePlan& plan, const VideoFormat* video, const AudioFormat* audio,
+                  double fileLength) {
     constexpr double kFixed = 4096;
     constexpr double kPerPicture = 14;        // size, shift and a run of equal lengths
     constexpr double kPerUnevenPicture = 22;  // and lengths of their own
@@ -183,6 +184,8 @@ int64_t IndexSize(const FilePlan& plan, const VideoFormat* video, const AudioFor
         length = std::max(length, audio->dDuration);
         perSecond += kPerPacket * plan.sound->settings.sampleRate / kSamplesPerPacket;
     }
+    if (fileLength > 0 && (length <= 0 || fileLength < length))
+        length = fileLength;
     const double size = (length > 0 ? length : kUnknown) * perSecond;
     return static_cast<int64_t>(kFixed + (size < kMost ? size : kMost));
 }
@@ -203,7 +206,7 @@ FilePlan MakeFilePlan(const EncodeParam& param, const VideoFormat* video, const 
         throw WriterFailure(kWriterErrorArgument,
                             "There is nothing to write into a file of the format " + FormatText(param) + ".");
     plan.bitExact = options.bBitExact != 0;
-    plan.indexSize = IndexSize(plan, video, audio);
+    plan.indexSize = IndexSize(plan, video, audio, options.dFileLength);
     return plan;
 }
 

@@ -155,6 +155,9 @@ typedef struct WriterOptions {
     int32_t nSpeed;
     double dQuality;  ///< On the codec's own scale, where less is better; see MWGetQualityScale.
     int32_t nProfile; ///< Of H.264: 1 baseline, 2 main, 3 high; 0: as the encoder likes.
+    /// Seconds that each file will last when that is less than the source does, as clips; 0: not known. MP4,
+    /// MOV and M4A leave room for their index by it.
+    double dFileLength;
 } WriterOptions;
 
 /// What distinguishes a file format beside what FileFormatInfo says.
