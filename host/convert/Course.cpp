@@ -5,6 +5,7 @@
 #include "host/convert/CodecPlan.h"
 #include "host/convert/EncodePlan.h"
 #include "host/convert/Room.h"
+#include "host/convert/SizePlan.h"
 #include "text/Path.h"
 
 #include <algorithm>
@@ -40,15 +41,15 @@ WorkClock::Time Now() {
 } // namespace
 
 Course::Course(const Request& request, Movie& movie, Wishes& wishes, Observer& observer)
-    : request_(request),
+    : request_(FitIntoSize(request, movie.Info())),
       movie_(movie),
       wishes_(wishes),
       observer_(observer),
-      length_(LengthToConvert(request, movie.Info())),
+      length_(LengthToConvert(request_, movie.Info())),
       clips_(movie, request.begin, request.split),
-      watch_(request, movie.Info(), wishes.bell),
+      watch_(request_, movie.Info(), wishes.bell),
       files_(observer),
-      engine_(MakeEngine(request, movie.Info(), clips_.Pictures(), clips_.Sound(), watch_.OptionSet())),
+      engine_(MakeEngine(request_, movie.Info(), clips_.Pictures(), clips_.Sound(), watch_.OptionSet())),
       clock_(Now()) {
     if (request.length)
         movie.EndPicturesAt(request.begin + length_);
@@ -59,6 +60,8 @@ Verdict Course::Run() {
     observer_.Started({request_.input, request_.output, length_, lengthKnown});
     for (const NotCarried& left : CarryOver(movie_, ChooseFormat(request_), watch_.OptionSet()))
         observer_.LeftBehind(left);
+    if (request_.maxSize)
+        observer_.Warned({Warning::Kind::kChosen, TellSize(request_)});
     if ((lengthKnown || request_.length) && HasRates(request_, ChooseFormat(request_), movie_.Info()))
         WarnOfSmallRoom();
     clock_.Skip(Now());
@@ -304,6 +307,10 @@ std::optional<Failure> Course::FindFailure() {
         return Failure(Category::kSource,
                        fmt::format("reading \"{}\" failed after {}: {}; what was read is converted",
                                    request_.input, FormatTime(request_.begin + Position(), true), reason));
+    }
+    if (request_.maxSize && files_.Bytes() > *request_.maxSize) {
+        return Failure(Category::kOutput, fmt::format("\"{}\" has become larger than asked for: {}",
+                                                      request_.output, FormatBytes(files_.Bytes())));
     }
     if (outcome_ == kOutcomeCompleted || (userStopped_ && outcome_ == kOutcomeStopped))
         return std::nullopt;

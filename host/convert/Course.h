@@ -71,7 +71,7 @@ private:
     std::string WhyItEndedEarly() const;
     void ReportComplaints();
 
-    const Request& request_;
+    const Request request_; // with rates by the greatest size
     Movie& movie_;
     Wishes& wishes_;
     Observer& observer_;

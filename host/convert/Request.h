@@ -41,6 +41,8 @@ struct Request {
     std::optional<int32_t> channels;
     std::optional<int32_t> sampleRate; ///< Samples per second and channel.
     Deinterlace deinterlace = Deinterlace::kFlagged;
+    /// Bytes that the output may have at most: chooses the rates, and where they are low a picture size.
+    std::optional<int64_t> maxSize;
     bool noVideo = false;
     bool noAudio = false;
     bool playlists = false; ///< The input may be a playlist, which names movies in its folder and below.

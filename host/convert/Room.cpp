@@ -4,6 +4,7 @@
 #include "host/convert/EncodePlan.h"
 #include "host/convert/Engine.h"
 #include "host/convert/Failure.h"
+#include "host/convert/SizePlan.h"
 #include "host/convert/Sources.h"
 #include "text/Path.h"
 
@@ -27,11 +28,12 @@ Room EstimateRoom(const Request& request) {
                       Reason::kUnknownLength);
     }
     const double length = LengthToConvert(request, movie.Info());
-    const Engine engine = MakeEngine(request, movie.Info(), movie.Pictures(), movie.Sound());
+    const Request fitted = FitIntoSize(request, movie.Info());
+    const Engine engine = MakeEngine(fitted, movie.Info(), movie.Pictures(), movie.Sound());
     EncodeParam param{};
     MCGetEncodeParam(engine.get(), &param);
     const std::string folder = text::FolderOf(request.output);
-    const bool known = HasRates(request, ChooseFormat(request), movie.Info());
+    const bool known = HasRates(fitted, ChooseFormat(fitted), movie.Info());
     return {length, known ? MCGetEstimateDiskSpaceEx(&param, length) : -1, folder, FreeBytes(folder)};
 }
 

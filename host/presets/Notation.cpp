@@ -58,6 +58,23 @@ std::optional<int32_t> ParseRate(std::string_view text) {
     return static_cast<int32_t>(std::lround(*number * factor));
 }
 
+std::optional<int64_t> ParseBytes(std::string_view text) {
+    constexpr double kMost = 1e15;
+    double factor = 1;
+    if (!text.empty() && (text.back() == 'k' || text.back() == 'K'))
+        factor = 1e3;
+    else if (!text.empty() && text.back() == 'M')
+        factor = 1e6;
+    else if (!text.empty() && text.back() == 'G')
+        factor = 1e9;
+    if (factor > 1)
+        text.remove_suffix(1);
+    const auto number = ParseNumber(text);
+    if (!number || *number * factor < 1 || *number * factor > kMost)
+        return std::nullopt;
+    return std::llround(*number * factor);
+}
+
 std::optional<Size> ParseSize(std::string_view text) {
     const std::size_t cross = text.find('x');
     if (cross == std::string_view::npos || !IsDigits(text.substr(0, cross)) ||

@@ -16,6 +16,9 @@ std::optional<double> ParseTime(std::string_view text);
 /// Bits per second from "512000", "512k" or "1.5M" (powers of 1000). Nothing for anything else, 0 included.
 std::optional<int32_t> ParseRate(std::string_view text);
 
+/// Bytes from "25000000", "700k", "25M" or "4.7G" (powers of 1000). Nothing for anything else, 0 included.
+std::optional<int64_t> ParseBytes(std::string_view text);
+
 /// From "640x360", both from 2 to 32768. Nothing for anything else.
 std::optional<Size> ParseSize(std::string_view text);
 

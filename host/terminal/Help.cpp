@@ -16,10 +16,10 @@ namespace {
 constexpr std::size_t kHelpColumn = 26;
 
 /// What most people need, and --help shows.
-constexpr std::array<std::string_view, 17> kUsual{
-    "INPUT",  "OUTPUT",      "begin",        "length",       "split",   "preset",
-    "format", "video-codec", "audio-codec",  "size",         "quality", "overwrite",
-    "quiet",  "info",        "list-formats", "list-presets", "help-all"};
+constexpr std::array<std::string_view, 18> kUsual{
+    "INPUT",     "OUTPUT",      "begin",       "length",       "split",        "preset",
+    "format",    "video-codec", "audio-codec", "size",         "quality",      "max-size",
+    "overwrite", "quiet",       "info",        "list-formats", "list-presets", "help-all"};
 
 class HelpFormatter final : public CLI::Formatter {
 public:

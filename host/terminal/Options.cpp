@@ -111,6 +111,10 @@ void AddPictures(CLI::App& app, Options& options) {
         ->check(CLI::Range(0.0, 63.0).description(""))
         ->type_name("N")
         ->group(group);
+    AddParsed(app, "--max-size", ParseBytes, options.request.maxSize, "a size such as 700k, 25M or 4.7G",
+              "The output's greatest size, as 25M: chooses rates, and\na smaller picture where they are low")
+        ->type_name("BYTES")
+        ->group(group);
     AddChoice<Speed>(app, "--speed", options.request.speed, SpeedChoices(),
                      "How long the encoder looks for a smaller file")
         ->type_name("SPEED")
@@ -234,6 +238,10 @@ void RequireNames(const Options& options) {
         throw Failure(Category::kRequest, "OUTPUT is missing; try \"movieconv --help\"");
     if (options.request.noVideo && options.request.noAudio)
         throw Failure(Category::kRequest, "--no-video and --no-audio together leave nothing to convert");
+    if (options.request.maxSize && (options.request.quality || options.request.videoRate ||
+                                    options.request.audioRate || options.request.split))
+        throw Failure(Category::kRequest, "--max-size chooses the rates of one file: it excludes --quality, "
+                                          "--video-rate, --audio-rate and --split");
     if (options.request.quality && options.request.videoRate)
         throw Failure(Category::kRequest, "--quality and --video-rate exclude each other");
     if (options.request.length && *options.request.length < 0.001)

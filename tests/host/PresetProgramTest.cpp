@@ -121,6 +121,53 @@ TEST(ProgramPresets, AreTheStandardAndGiveWayToOptions) {
     EXPECT_NE(size({"--speed", "slow"}), size({"--speed", "fastest"}));
 }
 
+struct Sized {
+    const char* name;
+    const char* pictures; ///< An lavfi source; empty: none.
+    const char* sound;
+    int64_t most;
+    const char* output = "o.mp4";
+};
+
+// Sources that are hard to keep small, and some that are not.
+TEST(ProgramMaxSize, IsNeverExceeded) {
+    const Sized cases[] = {
+        {"noise", "nullsrc=s=320x240:r=25:d=6,geq=random(1)*255:128:128", "anoisesrc=d=6", 200'000},
+        {"tiny", "nullsrc=s=320x240:r=25:d=6,geq=random(1)*255:128:128", "anoisesrc=d=6", 90'000},
+        {"bars", "testsrc2=s=640x360:r=25:d=6", "sine=d=6", 150'000},
+        {"fast", "testsrc2=s=320x180:r=100:d=4", "sine=d=4", 150'000},
+        {"black", "color=black:s=640x360:r=25:d=6", "sine=d=6", 100'000},
+        {"fractal", "mandelbrot=s=480x360:r=25,trim=duration=5", "sine=d=5", 120'000},
+        {"life", "life=s=320x240:r=25:mold=10,trim=duration=5", "sine=d=5", 120'000, "o.mkv"},
+        {"silent", "testsrc2=s=320x240:r=25:d=6", "", 100'000, "o.ts"},
+        {"short", "testsrc2=s=640x360:r=25:d=0.4", "sine=d=0.4", 60'000},
+        {"tall", "testsrc2=s=120x640:r=30:d=6", "sine=d=6", 100'000, "o.mov"},
+        {"sound", "", "anoisesrc=d=20", 200'000, "o.m4a"},
+    };
+    for (const Sized& test : cases) {
+        SCOPED_TRACE(test.name);
+        Args making;
+        for (const std::string input : {test.pictures, test.sound})
+            if (!input.empty())
+                making = Join(making, Args{"-f", "lavfi", "-i", input});
+        const std::string source =
+            Make(std::string("sized-") + test.name + ".mkv",
+                 Join(making, Args{"-c:v", "mpeg4", "-q:v", "2", "-c:a", "pcm_s16le"}));
+        const Folder folder;
+        const std::string output = folder / test.output;
+        const Result result =
+            Call({"--preset", "standard", "--max-size", std::to_string(test.most), source, output});
+        ASSERT_EQ(result.code, 0) << result.err;
+        EXPECT_NE(result.err.find("to keep below"), std::string::npos) << result.err;
+        EXPECT_LE(static_cast<int64_t>(fs::file_size(output)), test.most);
+        EXPECT_GT(movieconv::Movie(output, {}).Info().duration, 0.3);
+    }
+    const Folder folder;
+    const Result result = Call({"--preset", "standard", "--max-size", "5k", Grainy(), folder / "o.mp4"});
+    EXPECT_EQ(result.code, 2) << result.err;
+    EXPECT_NE(result.err.find("too little"), std::string::npos) << result.err;
+}
+
 TEST(ProgramPresets, AreListedShownAndRefused) {
     const Folder folder;
     const std::string own = folder / "movieconv/presets/";

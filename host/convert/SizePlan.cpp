@@ -1,0 +1,127 @@
+#include "host/convert/SizePlan.h"
+
+#include "host/convert/Amounts.h"
+#include "host/convert/CodecPlan.h"
+#include "host/convert/EncodePlan.h"
+#include "host/convert/Failure.h"
+#include "media/FourCC.h"
+
+#include <algorithm>
+#include <cmath>
+#include <cstdint>
+#include <fmt/format.h>
+
+namespace movieconv {
+namespace {
+
+// Encoders keep to a rate on the whole only: what they may exceed it by is left free.
+constexpr double kSoundSpread = 1.15;
+constexpr double kBufferSeconds = 2;    // of pictures, ahead of their rate
+constexpr double kLeastSoundBits = 0.5; // a sample and channel, below which the encoders do not go
+constexpr double kMostSoundShare = 0.25;
+constexpr double kUsualSoundRate = 128'000;
+constexpr double kLeastPictureRate = 4000;
+
+// What a container adds.
+constexpr double kHeadBits = 16384 * 8;
+constexpr double kPacketBits = 48 * 8;
+constexpr double kSamplesPerPacket = 1024;
+constexpr double kShare = 0.96;
+constexpr double kPacketStreamShare = 0.85; // of formats that cut all into small packets
+
+bool IsAmong(uint32_t code, std::initializer_list<uint32_t> codes) {
+    return std::find(codes.begin(), codes.end(), code) != codes.end();
+}
+
+/// Bits per pixel below which pictures had better be smaller.
+double LeastBitsPerPixel(uint32_t codec) {
+    constexpr double kModern = 0.04;
+    constexpr double kOld = 0.15;
+    return IsAmong(codec, {FourCC("H264"), FourCC("HEVC"), FourCC("VP90"), FourCC("AV01")}) ? kModern : kOld;
+}
+
+/// Sets the sound's rate, `share` at most where that is enough; what it can take at most, in bits per second.
+double FitSound(Request& request, const FileFormatInfo& format, const SoundStreamInfo& source, double share) {
+    SoundPlan plan = PlanSound(request, format, source);
+    const double sampleRate = plan.sampleRate.value_or(source.sampleRate);
+    if (IsAmong(plan.codec.value_or(format.fccAudioCodecs[0]),
+                {FourCC("PCM "), FourCC("FLAC"), FourCC("ALAC")}))
+        return sampleRate * plan.channels.value_or(source.channels) * source.bitsPerSample;
+    const double least = kLeastSoundBits * sampleRate;
+    if (!request.channels && share < least * plan.channels.value_or(source.channels)) {
+        request.channels = share < least * 2 ? 1 : std::min(2, source.channels);
+        plan = PlanSound(request, format, source);
+    }
+    const double floor = least * plan.channels.value_or(source.channels);
+    const double rate =
+        std::max(floor, std::min(share, static_cast<double>(plan.rate.value_or(kUsualSoundRate))));
+    request.audioRate = static_cast<int32_t>(rate);
+    return rate * kSoundSpread;
+}
+
+void FitPictures(Request& request, const FileFormatInfo& format, const PictureStreamInfo& source,
+                 double rate) {
+    request.videoRate = static_cast<int32_t>(std::min<double>(rate, INT32_MAX));
+    request.videoMaxRate = request.videoRate;
+    const PicturePlan plan = PlanPictures(request, format, source);
+    if (request.size)
+        return;
+    const Size size = plan.size.value_or(Size{source.width, source.height});
+    const double pixels =
+        static_cast<double>(size.width) * size.height * plan.frameRate.value_or(source.frameRate);
+    const double factor = std::sqrt(rate / std::max(pixels, 1.0) / LeastBitsPerPixel(plan.codec.value_or(0)));
+    if (factor >= 1)
+        return;
+    static constexpr int32_t kLeastLength = 64; // what every encoder takes
+    const auto shorter = [factor](int32_t length) {
+        return std::min(length, std::max(kLeastLength, static_cast<int32_t>(length * factor / 2) * 2));
+    };
+    request.size = Size{shorter(size.width), shorter(size.height)};
+}
+
+} // namespace
+
+Request FitIntoSize(Request request, const SourceInfo& source) {
+    if (!request.maxSize)
+        return request;
+    const FileFormatInfo& format = ChooseFormat(request);
+    if (source.certainty == Certainty::kGuessed && !request.length) {
+        throw Failure(Category::kRequest, fmt::format("\"{}\" does not tell how long it is", request.input),
+                      Reason::kUnknownLength);
+    }
+    const double length = std::max(LengthToConvert(request, source), 0.001);
+    const bool pictures = source.pictures && format.bHasVideo != 0;
+    const bool sound = source.sound && format.bHasAudio != 0;
+    if (pictures && IsAmong(ChooseVideoCodec(request, format).value_or(0), {FourCC("FFV1")}))
+        throw Failure(Category::kRequest, "a codec without loss cannot keep below a size");
+    const bool packets = IsAmong(format.fccFormat, {FourCC("TS  "), FourCC("MPG ")});
+    const double packetRate = (pictures ? source.pictures->peakRate : 0) +
+                              (sound ? source.sound->sampleRate / kSamplesPerPacket : 0);
+    const double free = static_cast<double>(*request.maxSize) * 8 * (packets ? kPacketStreamShare : kShare) -
+                        kHeadBits - packetRate * length * kPacketBits;
+    const double soundRate = sound ? FitSound(request, format, *source.sound,
+                                              free / length * (pictures ? kMostSoundShare : 1 / kSoundSpread))
+                                   : 0;
+    const double pictureRate = (free - soundRate * length) / (length + kBufferSeconds);
+    if (pictureRate < (pictures ? kLeastPictureRate : 0)) {
+        throw Failure(
+            Category::kRequest,
+            fmt::format("{} are too little for {}", FormatBytes(*request.maxSize), FormatTime(length, true)));
+    }
+    if (pictures)
+        FitPictures(request, format, *source.pictures, pictureRate);
+    return request;
+}
+
+std::string TellSize(const Request& fitted) {
+    std::string text = fmt::format("to keep below {}:", FormatBytes(fitted.maxSize.value_or(0)));
+    if (fitted.videoRate)
+        text +=
+            fmt::format(" pictures at {} kbit/s{}", *fitted.videoRate / 1000,
+                        fitted.size ? fmt::format(" in {}x{}", fitted.size->width, fitted.size->height) : "");
+    if (fitted.audioRate)
+        text += fmt::format("{} sound at {} kbit/s", fitted.videoRate ? "," : "", *fitted.audioRate / 1000);
+    return text;
+}
+
+} // namespace movieconv
