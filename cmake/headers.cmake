@@ -10,6 +10,12 @@ set(public_headers
   engine/PostMessage.h
   engine/ProgressInfo.h
   engine/Result.h
+  host/convert/Failure.h
+  host/convert/Formats.h
+  host/convert/Job.h
+  host/convert/Observer.h
+  host/convert/Request.h
+  host/convert/Room.h
   logsink/LogSink.h
   media/Decoders.h
   media/EncodeParam.h
@@ -26,7 +32,7 @@ set(public_headers
 set(public_header_dir ${PROJECT_BINARY_DIR}/include/movieconv)
 foreach(header IN LISTS public_headers)
   file(READ ${PROJECT_SOURCE_DIR}/${header} text)
-  set(module "(Common/Image|api|engine|logsink|media|platform|thread|writer)")
+  set(module "(Common/Image|api|engine|host/convert|logsink|media|platform|thread|writer)")
   string(REGEX REPLACE "#include \"${module}/([A-Za-z]+\\.h)\"" "#include <movieconv/\\2>" text "${text}")
   string(REGEX REPLACE "([^A-Za-z/])${module}/([A-Za-z]+\\.h)" "\\1<movieconv/\\3>" text "${text}")
   cmake_path(GET header FILENAME name)

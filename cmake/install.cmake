@@ -54,6 +54,14 @@ install(DIRECTORY ${document_dir}/ DESTINATION ${doc_dir})
 install(FILES LICENSE DESTINATION ${doc_dir} RENAME copyright)
 install(DIRECTORY examples/ DESTINATION ${doc_dir}/examples)
 
+# find_package(MovieConv COMPONENTS convert)
+foreach(library IN ITEMS convert source text)
+  set_target_properties(movieconv_${library} PROPERTIES EXPORT_NAME ${library})
+endforeach()
+install(TARGETS movieconv_convert movieconv_source movieconv_text EXPORT MovieConvHostTargets ARCHIVE DESTINATION ${home_dir})
+target_include_directories(movieconv_convert INTERFACE $<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}>)
+install(EXPORT MovieConvHostTargets NAMESPACE MovieConv:: DESTINATION ${package_dir})
+
 # find_package(MovieConv)
 install(EXPORT MovieConvTargets NAMESPACE MovieConv:: DESTINATION ${package_dir})
 configure_package_config_file(cmake/MovieConvConfig.cmake.in ${CMAKE_BINARY_DIR}/MovieConvConfig.cmake

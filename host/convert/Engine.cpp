@@ -1,6 +1,5 @@
 #include "host/convert/Engine.h"
 
-#include "engine/PostMessage.h"
 #include "host/convert/EncodePlan.h"
 #include "host/convert/Failure.h"
 #include "text/Utf8.h"
