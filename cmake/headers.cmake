@@ -14,8 +14,10 @@ set(public_headers
   host/convert/Formats.h
   host/convert/Job.h
   host/convert/Observer.h
+  host/convert/Preferences.h
   host/convert/Request.h
   host/convert/Room.h
+  host/source/Deinterlace.h
   logsink/LogSink.h
   media/Decoders.h
   media/EncodeParam.h
@@ -32,7 +34,7 @@ set(public_headers
 set(public_header_dir ${PROJECT_BINARY_DIR}/include/movieconv)
 foreach(header IN LISTS public_headers)
   file(READ ${PROJECT_SOURCE_DIR}/${header} text)
-  set(module "(Common/Image|api|engine|host/convert|logsink|media|platform|thread|writer)")
+  set(module "(Common/Image|api|engine|host/convert|host/source|logsink|media|platform|thread|writer)")
   string(REGEX REPLACE "#include \"${module}/([A-Za-z]+\\.h)\"" "#include <movieconv/\\2>" text "${text}")
   string(REGEX REPLACE "([^A-Za-z/])${module}/([A-Za-z]+\\.h)" "\\1<movieconv/\\3>" text "${text}")
   cmake_path(GET header FILENAME name)
