@@ -1,6 +1,7 @@
 // The functions on texts: the log module's, UTF-8, a program's place as a URL, the notations of the command
 // line.
 #include "fuzz/Fuzz.h"
+#include "host/convert/Amounts.h"
 #include "host/presets/Notation.h"
 #include "log/dyLog.h"
 #include "platform/BundleUrl.h"
