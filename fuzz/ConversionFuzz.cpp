@@ -1,5 +1,6 @@
 // Whole conversions: the three loops behind the MC functions, over decoders whose pictures, blocks and
 // formats come from the input, into the recording writer; and the helpers for sound.
+#include "engine/AudioHelpers.h"
 #include "fuzz/Fuzz.h"
 #include "tests/engine/ScriptedHost.h"
 
