@@ -178,10 +178,11 @@ int64_t IndexSize(const FilePlan& plan, const VideoFormat* video, const AudioFor
     if (plan.pictures) {
         length = video->dDuration;
         perSecond += (plan.pictures->keepStamps ? kPerUnevenPicture : kPerPicture) *
-                     std::max(av_q2d(plan.pictures->clock.rate), video->dFrameRate);
+                     std::max(av_q2d(plan.pictures->clock.rate),
+                              double{video->dFrameRate}); // copies: the records are packed
     }
     if (plan.sound) {
-        length = std::max(length, audio->dDuration);
+        length = std::max(length, double{audio->dDuration});
         perSecond += kPerPacket * plan.sound->settings.sampleRate / kSamplesPerPacket;
     }
     if (fileLength > 0 && (length <= 0 || fileLength < length))

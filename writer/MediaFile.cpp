@@ -29,7 +29,7 @@ bool Usable(const VideoImage& image) {
 std::optional<int64_t> SourceTime(const unsigned char* reserved) {
     WriterSourceTime time{};
     std::memcpy(&time, reserved, sizeof time);
-    return time.nTag == kWriterSourceTimeTag ? std::optional(time.llTime) : std::nullopt;
+    return time.nTag == kWriterSourceTimeTag ? std::optional(int64_t{time.llTime}) : std::nullopt;
 }
 
 PcmFormat FormatOf(const AudioFrame& frame) {

@@ -289,11 +289,11 @@ TEST(SourcesTest, BeginWhereAskedTo) {
         const recorder::Recording recording = recorder::Recorded();
         ASSERT_EQ(recording.pictures.size(), 5U);
         ASSERT_EQ(recording.sounds.size(), 10U);
-        EXPECT_EQ(recording.pictures[0].llTime, 0);
-        EXPECT_EQ(recording.pictures[4].llTime, 4000000);
+        EXPECT_EQ(+recording.pictures[0].llTime, 0);
+        EXPECT_EQ(+recording.pictures[4].llTime, 4000000);
         EXPECT_EQ(recording.pictures[0].nPitchU, TableSource::kWidth / 2);
-        EXPECT_EQ(recording.sounds[9].llTime, 4500000);
-        EXPECT_EQ(recording.sounds[9].nDuration, 500000);
+        EXPECT_EQ(+recording.sounds[9].llTime, 4500000);
+        EXPECT_EQ(+recording.sounds[9].nDuration, 500000);
         EXPECT_EQ(source.seeks, seeks ? 2 : 0);
         MCDestroy(handle);
     }
