@@ -1,9 +1,9 @@
 // What befalls a conversion from outside: the input is cut or removed, the output's folder goes, threads
 // cannot be started. The program tells it by its exit code and leaves no half file under a real name.
 #include "tests/faults/CrashReport.h"
-#include "tests/host/Inspect.h"
-#include "tests/host/Program.h"
-#include "tests/host/TestMovies.h"
+#include "tests/support/Inspect.h"
+#include "tests/support/Program.h"
+#include "tests/support/TestMovies.h"
 
 #include <gtest/gtest.h>
 

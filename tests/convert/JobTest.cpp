@@ -1,0 +1,220 @@
+// One conversion as a library: its news, its control, what befalls its files.
+#include "media/FourCC.h"
+#include "tests/convert/Listener.h"
+#include "tests/support/Inspect.h"
+#include "tests/support/SmallDisk.h"
+#include "tests/support/TestMovies.h"
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <condition_variable>
+#include <deque>
+#include <filesystem>
+#include <mutex>
+
+namespace {
+
+namespace fs = std::filesystem;
+using namespace movieconv;
+using namespace test_movies;
+using namespace inspect;
+
+std::string Short() {
+    return Make("job-short.mkv",
+                Join(CountedPictures(4), Beeps(4), Args{"-c:v", "mpeg4", "-c:a", "pcm_s16le"}));
+}
+std::string Minute() {
+    return Make("job-minute.mkv",
+                Join(CountedPictures(60), Beeps(60), Args{"-c:v", "mpeg4", "-c:a", "pcm_s16le"}));
+}
+
+Request Converting(const std::string& input, const std::string& output) {
+    Request request;
+    request.input = input;
+    request.output = output;
+    return request;
+}
+
+std::string TextOf(const Verdict& verdict) {
+    return verdict.failure ? verdict.failure->Text() : "";
+}
+
+TEST(Job, TellsEverythingOnTheObserversThread) {
+    const Folder folder;
+    std::mutex mutex;
+    std::condition_variable posted;
+    std::deque<std::function<void()>> work;
+    const Loop loop = [&](std::function<void()> one) {
+        const std::lock_guard lock(mutex);
+        work.push_back(std::move(one));
+        posted.notify_one();
+    };
+    Listener listener;
+    Request request = Converting(Short(), folder / "out.mp4");
+    request.preview = std::chrono::milliseconds(0);
+    Job job(request, listener, loop);
+    job.Start();
+    while (listener.ends == 0) {
+        std::unique_lock lock(mutex);
+        posted.wait(lock, [&] { return !work.empty(); });
+        const std::function<void()> one = std::move(work.front());
+        work.pop_front();
+        lock.unlock();
+        one();
+    }
+    EXPECT_EQ(job.Result()->outcome, Outcome::kDone) << TextOf(*job.Result());
+    EXPECT_EQ(job.Result()->files, 1);
+    EXPECT_EQ(job.Result()->bytes, static_cast<int64_t>(fs::file_size(folder / "out.mp4")));
+    EXPECT_NEAR(job.Result()->position, 4, 0.05);
+    EXPECT_EQ(listener.starts, 1);
+    EXPECT_EQ(listener.closed, Args{folder / "out.mp4"});
+    ASSERT_FALSE(listener.pictures.empty());
+    const ShownPicture& last = *listener.pictures.back();
+    ASSERT_EQ(last.bgra.size(), 160u * 120 * 4);
+    const int grey = (LumaOf(99) - 16) * 255 / 219; // luma from 16 to 235
+    EXPECT_NEAR(last.bgra[0], grey, 4);
+    EXPECT_EQ(last.bgra[3], 255);
+    for (const std::thread::id thread : listener.threads)
+        EXPECT_EQ(thread, std::this_thread::get_id());
+}
+
+TEST(Job, RefusesWithACategory) {
+    const Folder folder;
+    WriteFile(folder / "there.mp4", "precious");
+    WriteFile(folder / "text.mkv", "words");
+    Request begin = Converting(Short(), folder / "o.mp4");
+    begin.begin = 9;
+    Request codec = Converting(Short(), folder / "o.webm");
+    codec.videoCodec = FourCC("XVID");
+    Request split = Converting(Short(), folder / "o.mp3");
+    split.split = 1;
+    const struct {
+        Request request;
+        Category category;
+        Reason reason;
+    } cases[] = {
+        {Converting(Short(), folder / "there.mp4"), Category::kOutput, Reason::kExists},
+        {Converting(Short(), folder / "nowhere/o.mp4"), Category::kOutput, Reason::kOther},
+        {Converting(Short(), folder / "o.xyz"), Category::kRequest, Reason::kNoFormat},
+        {Converting(folder / "text.mkv", folder / "o.mp4"), Category::kSource, Reason::kOther},
+        {Converting(folder / "none.mkv", folder / "o.mp4"), Category::kSource, Reason::kOther},
+        {begin, Category::kRequest, Reason::kBeginTooLate},
+        {codec, Category::kRequest, Reason::kCodec},
+        {split, Category::kRequest, Reason::kOther},
+    };
+    for (const auto& test : cases) {
+        Listener listener;
+        const Verdict verdict = Convert(test.request, listener);
+        EXPECT_EQ(verdict.outcome, Outcome::kFailed);
+        ASSERT_TRUE(verdict.failure);
+        EXPECT_EQ(verdict.failure->Kind(), test.category) << TextOf(verdict);
+        EXPECT_EQ(verdict.failure->Why(), test.reason) << TextOf(verdict);
+        EXPECT_EQ(verdict.failure->Text().find("--"), std::string::npos) << TextOf(verdict);
+        EXPECT_EQ(listener.starts, 0);
+        EXPECT_EQ(listener.ends, 1);
+    }
+    EXPECT_EQ(folder.Names(), (Args{"text.mkv", "there.mp4"}));
+}
+
+TEST(Job, PausesAndStops) {
+    const Folder folder;
+    Listener listener;
+    Request request = Converting(Minute(), folder / "out.mp4");
+    Job job(request, listener);
+    bool pausedOnce = false;
+    listener.onProgress = [&](const Progress& news) {
+        if (news.phase == Phase::kPaused)
+            job.Resume();
+        else if (pausedOnce && news.position > 0)
+            job.Stop();
+        else if (news.position > 0)
+            job.Pause();
+        pausedOnce = pausedOnce || news.phase == Phase::kPaused;
+    };
+    job.Start();
+    job.Wait();
+    EXPECT_TRUE(pausedOnce);
+    EXPECT_EQ(job.Result()->outcome, Outcome::kStopped) << TextOf(*job.Result());
+    const std::size_t pictures = LookAt(folder / "out.mp4").pictures.size();
+    EXPECT_GT(pictures, 0u);
+    EXPECT_LT(pictures, 1500u);
+}
+
+// Nobody tells whether what is written still has a name: the conversion has to look, and has to prove at its
+// end that all is there.
+TEST(Job, IsNoSuccessWhenItsFileVanishes) {
+    for (const std::string extension : {"mp4", "mov", "mkv", "ts"}) {
+        for (const bool folderToo : {false, true}) {
+            SCOPED_TRACE(extension);
+            const Folder folder;
+            fs::create_directory(folder / "out");
+            Listener listener;
+            std::string vanished;
+            listener.onOpened = [&](const OpenedFile& news) {
+                vanished = news.temporaryPath;
+                if (folderToo) {
+                    fs::rename(folder / "out", folder / "moved");
+                    fs::create_directory(folder / "out");
+                } else {
+                    fs::remove(vanished);
+                }
+            };
+            const Verdict verdict =
+                Convert(Converting(Minute(), folder / "out/movie." + extension), listener);
+            EXPECT_EQ(verdict.outcome, Outcome::kFailed);
+            ASSERT_TRUE(verdict.failure);
+            EXPECT_EQ(verdict.failure->Kind(), Category::kOutput);
+            EXPECT_NE(TextOf(verdict).find("\"" + vanished + "\" vanished"), std::string::npos)
+                << TextOf(verdict);
+        }
+    }
+}
+
+TEST(Job, IsNoSuccessWhenAClipVanishesOrIsAnother) {
+    for (const bool replaced : {false, true}) {
+        const Folder folder;
+        Listener listener;
+        listener.onOpened = [&](const OpenedFile& news) {
+            if (news.number != 3)
+                return;
+            fs::remove(folder / "movie_01.mkv");
+            if (replaced)
+                WriteFile(folder / "movie_01.mkv", "precious");
+        };
+        Request request = Converting(Short(), folder / "movie.mkv");
+        request.split = 1;
+        const Verdict verdict = Convert(request, listener);
+        EXPECT_EQ(listener.closed.size(), 4u);
+        EXPECT_EQ(verdict.outcome, Outcome::kFailed);
+        EXPECT_NE(TextOf(verdict).find("movie_01.mkv"), std::string::npos) << TextOf(verdict);
+    }
+}
+
+// On a disk that is smaller than any reserve one could ask for.
+TEST(Job, WaitsForAsMuchRoomAsItNeeds) {
+    const Folder folder;
+    const SmallDisk disk(folder / "disk", "400k");
+    if (!disk.IsThere())
+        GTEST_SKIP() << "no small disk can be mounted here";
+    WriteFile(folder / "disk/ballast", std::string(300'000, 'x'));
+    Listener listener;
+    listener.onProgress = [&](const Progress& news) {
+        if (news.phase == Phase::kWaitingForRoom)
+            fs::remove(folder / "disk/ballast");
+    };
+    Request request = Converting(Short(), folder / "disk/out.mkv");
+    request.audioCodec = FourCC("PCM ");
+    request.length = 3;
+    request.onFull = OnFull::kWait;
+    const Verdict verdict = Convert(request, listener);
+    EXPECT_EQ(verdict.outcome, Outcome::kDone) << TextOf(verdict);
+    ASSERT_FALSE(listener.warnings.empty());
+    const Warning& warning = listener.warnings.back();
+    EXPECT_EQ(warning.kind, Warning::Kind::kWaitsForRoom);
+    EXPECT_NE(warning.text.find("room for"), std::string::npos) << warning.text;
+    EXPECT_EQ(std::count(listener.phases.begin(), listener.phases.end(), Phase::kWaitingForRoom), 1);
+    EXPECT_EQ(LookAt(folder / "disk/out.mkv").pictures.size(), 75u);
+}
+
+} // namespace

@@ -1,0 +1,104 @@
+// Interlaced and HDR pictures, measured where they are handed to the engine.
+#include "host/source/Movie.h"
+#include "tests/support/TestMovies.h"
+
+#include <gtest/gtest.h>
+
+#include <cstdlib>
+
+namespace {
+
+using namespace test_movies;
+using movieconv::Deinterlace;
+using movieconv::Movie;
+
+/// How much the rows differ from what lies above and below them: large where two moments are combed.
+double Comb(const VideoImage& image) {
+    int64_t sum = 0;
+    for (int y = 1; y + 1 < image.nHeight; ++y) {
+        const uint8_t* row = image.pY + static_cast<ptrdiff_t>(y) * image.nPitchY;
+        for (int x = 0; x < image.nWidth; ++x)
+            sum += std::abs(2 * row[x] - row[x - image.nPitchY] - row[x + image.nPitchY]);
+    }
+    return static_cast<double>(sum) / image.nWidth / image.nHeight;
+}
+
+struct Combed {
+    int pictures = 0;
+    double comb = 0;
+    bool told = false;
+};
+
+Combed LookFor(const std::string& path, Deinterlace deinterlace) {
+    Movie movie(path, {.deinterlace = deinterlace});
+    Combed seen;
+    while (const VideoImage* image = movie.Pictures()->GetCurrentImage()) {
+        EXPECT_NEAR(static_cast<double>(image->llTime) / kTicksPerSecond, seen.pictures / 25.0, 0.002);
+        seen.comb += Comb(*image);
+        ++seen.pictures;
+        if (movie.Pictures()->DecodeNext(1) < 1)
+            break;
+    }
+    for (const std::string& complaint : movie.Complaints())
+        seen.told = seen.told || complaint.find("interlaced") != std::string::npos;
+    seen.comb /= seen.pictures;
+    return seen;
+}
+
+std::string MovingBars(const char* name, const Args& making) {
+    return Make(name, Join(Args{"-f", "lavfi", "-i",
+                                "color=black:s=160x120:r=50:d=2,format=yuv420p,"
+                                "geq=lum='if(between(mod(X-N*4,80),0,40),220,30)':cb=128:cr=128"},
+                           making, Args{"-c:v", "libx264", "-qp", "10"}));
+}
+
+TEST(Filters, TakeTheCombFromPicturesThatSayTheyAreInterlaced) {
+    const Args interlace{"-vf", "tinterlace=interleave_top,setfield=tff", "-flags", "+ilme+ildct"};
+    const std::string flagged = MovingBars("interlaced.mkv", interlace);
+    const std::string unflagged =
+        MovingBars("combed.mkv", Args{"-vf", "tinterlace=interleave_top,setfield=prog"});
+    const struct {
+        std::string path;
+        Deinterlace deinterlace;
+        bool comb;
+    } cases[] = {
+        {flagged, Deinterlace::kFlagged, false},
+        {flagged, Deinterlace::kNone, true},
+        {unflagged, Deinterlace::kFlagged, true},
+        {unflagged, Deinterlace::kAll, false},
+    };
+    for (const auto& test : cases) {
+        SCOPED_TRACE(&test - cases);
+        const Combed seen = LookFor(test.path, test.deinterlace);
+        EXPECT_EQ(seen.pictures, 50);
+        EXPECT_EQ(seen.told, !test.comb);
+        EXPECT_TRUE(test.comb ? seen.comb > 20 : seen.comb < 3) << seen.comb;
+    }
+}
+
+TEST(Filters, BringHdrToTheLightOfUsualDisplays) {
+    for (const char* transfer : {"16", "18"}) { // PQ, HLG
+        SCOPED_TRACE(transfer);
+        const std::string path =
+            Make(std::string("ramp-") + transfer + ".mkv",
+                 {"-f", "lavfi", "-i",
+                  "color=black:s=256x64:r=25:d=0.2,format=yuv420p10le,geq=lum='64+X*876/255':cb=512:cr=512",
+                  "-c:v", "libx265", "-x265-params",
+                  std::string("log-level=none:colorprim=9:colormatrix=9:transfer=") + transfer});
+        Movie movie(path, {});
+        const VideoImage* image = movie.Pictures()->GetCurrentImage();
+        ASSERT_NE(image, nullptr);
+        const uint8_t* row = image->pY + static_cast<ptrdiff_t>(32) * image->nPitchY;
+        EXPECT_NEAR(row[2], 16, 3);
+        for (int x = 8; x < 256; x += 8)
+            EXPECT_GE(row[x] + 1, row[x - 8]) << x;
+        EXPECT_GT(row[128], 110); // some 100 cd/m2: a middle grey, no washed-out one
+        EXPECT_LT(row[128], 190);
+        for (int x = 0; x < 128; x += 8) {
+            EXPECT_NEAR(image->pU[16 * image->nPitchU + x], 128, 2) << x;
+            EXPECT_NEAR(image->pV[16 * image->nPitchV + x], 128, 2) << x;
+        }
+    }
+}
+
+} // namespace

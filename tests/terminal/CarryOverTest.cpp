@@ -1,0 +1,111 @@
+// What a movie holds beside its pictures and sound is in the output, or told.
+#include "tests/support/Folder.h"
+#include "tests/support/Program.h"
+#include "tests/support/TestMovies.h"
+
+#include <gtest/gtest.h>
+
+#include <string>
+
+namespace {
+
+using program::Call;
+using program::Result;
+using test_movies::Args;
+using test_movies::Beeps;
+using test_movies::CountedPictures;
+using test_movies::Join;
+
+/// Two seconds with texts, two chapters, subtitles, a cover and a font.
+std::string MakeWhole(const Folder& folder) {
+    WriteFile(folder / "words.srt", "1\n00:00:00,500 --> 00:00:01,000\nWords\n");
+    WriteFile(folder / "font.ttf", std::string(1000, 'f'));
+    WriteFile(folder / "notes.txt", ";FFMETADATA1\ntitle=The whole\nartist=Nobody\n"
+                                    "[CHAPTER]\nTIMEBASE=1/1000\nSTART=0\nEND=1000\ntitle=First\n"
+                                    "[CHAPTER]\nTIMEBASE=1/1000\nSTART=1000\nEND=2000\ntitle=Second\n");
+    EXPECT_EQ(program::Run(Join(Args{"ffmpeg", "-v", "error"}, CountedPictures(2),
+                                Args{"-frames:v", "1", folder / "cover.png"}))
+                  .code,
+              0);
+    const std::string path = folder / "whole.mkv";
+    const Args parts{"-i",
+                     folder / "words.srt",
+                     "-i",
+                     folder / "notes.txt",
+                     "-map",
+                     "0",
+                     "-map",
+                     "1",
+                     "-map",
+                     "2",
+                     "-map_metadata",
+                     "3",
+                     "-c:s",
+                     "srt",
+                     "-metadata:s",
+                     "language=ger",
+                     "-attach",
+                     folder / "cover.png",
+                     "-attach",
+                     folder / "font.ttf",
+                     "-metadata:s:3",
+                     "mimetype=image/png",
+                     "-metadata:s:4",
+                     "mimetype=font/ttf",
+                     path};
+    EXPECT_EQ(program::Run(Join(Args{"ffmpeg", "-v", "error"}, CountedPictures(2), Beeps(2), parts)).code, 0);
+    return path;
+}
+
+std::string Probe(const std::string& path) {
+    return program::Run(
+               {"ffprobe", "-v", "quiet", "-show_chapters", "-show_entries",
+                "format_tags:chapter=start_time,end_time:stream=codec_name,codec_type:stream_tags=language",
+                "-of", "compact", path})
+        .out;
+}
+
+bool Has(const std::string& text, const std::string& part) {
+    return text.find(part) != std::string::npos;
+}
+
+TEST(CarryOver, PutsIntoTheFileWhatItsFormatHoldsAndTellsTheRest) {
+    const Folder folder;
+    const std::string whole = MakeWhole(folder);
+    const Result mp4 = Call({whole, folder / "out.mp4", "--progress", "json"});
+    ASSERT_EQ(mp4.code, 0) << mp4.err;
+    EXPECT_TRUE(Has(
+        mp4.out, R"("event":"not_carried","kind":"subtitles","number":2,"codec":"subrip","language":"ger")"))
+        << mp4.out;
+    EXPECT_TRUE(Has(mp4.out, R"("event":"not_carried","kind":"attachment")"));
+    EXPECT_FALSE(Has(mp4.out, R"("kind":"cover")"));
+    EXPECT_FALSE(Has(mp4.out, R"("kind":"chapters")"));
+    const std::string inMp4 = Probe(folder / "out.mp4");
+    for (const char* part : {"tag:title=The whole", "tag:artist=Nobody", "tag:language=ger", "codec_name=png",
+                             "start_time=1.000000|end_time=2.000000|tag:title=Second"})
+        EXPECT_TRUE(Has(inMp4, part)) << part << " in " << inMp4;
+
+    const Result avi = Call({whole, folder / "out.avi", "--progress", "none"});
+    ASSERT_EQ(avi.code, 0) << avi.err;
+    for (const char* kind : {"chapters", "cover", "subtitles", "attachment"})
+        EXPECT_TRUE(Has(avi.err, std::string("movieconv: not carried: ") + kind)) << avi.err;
+    EXPECT_TRUE(Has(Probe(folder / "out.avi"), "tag:title=The whole"));
+    EXPECT_EQ(Call({whole, folder / "quiet.avi", "-q"}).err, "");
+}
+
+TEST(CarryOver, MovesChaptersWithTheRange) {
+    const Folder folder;
+    const std::string whole = MakeWhole(folder);
+    const Result result = Call({whole, folder / "out.mkv", "--begin", "0.4", "--length", "1.2", "-q"});
+    ASSERT_EQ(result.code, 0) << result.err;
+    const std::string read = Probe(folder / "out.mkv");
+    EXPECT_TRUE(Has(read, "start_time=0.000000|end_time=0.600000|tag:title=First")) << read;
+    EXPECT_TRUE(Has(read, "start_time=0.600000|end_time=1.2")) << read;
+    // What was carried is carried again, and MP4's own track of chapters is not told.
+    const Result again = Call({folder / "out.mkv", folder / "again.mp4", "--progress", "none"});
+    const Result third = Call({folder / "again.mp4", folder / "third.mp4", "--progress", "none"});
+    EXPECT_FALSE(Has(third.err, "not carried")) << third.err;
+    EXPECT_TRUE(Has(Probe(folder / "third.mp4"), "start_time=0.000000|end_time=0.600000|tag:title=First"));
+}
+
+} // namespace

@@ -1,0 +1,567 @@
+// Whole conversions, looked at from outside.
+#include "tests/support/Program.h"
+#include "tests/support/Inspect.h"
+#include "tests/support/SmallDisk.h"
+#include "tests/support/TestMovies.h"
+
+#include <gtest/gtest.h>
+
+#include <chrono>
+#include <csignal>
+#include <cstdio>
+#include <fcntl.h>
+#include <filesystem>
+#include <ostream>
+#include <sys/stat.h>
+#include <thread>
+#include <unistd.h>
+
+namespace {
+
+namespace fs = std::filesystem;
+using namespace test_movies;
+using namespace inspect;
+using program::Call;
+using program::Result;
+using program::Running;
+
+const Args kLossless{"-c:v", "mpeg4", "-q:v", "2", "-c:a", "pcm_s16le"};
+
+std::string Counted() {
+    return Make("counted-av.mkv", Join(CountedPictures(4), Beeps(4), kLossless));
+}
+std::string Flashing() {
+    return Make("flashing.mp4",
+                Join(FlashPictures(8), Beeps(8), Args{"-c:v", "libx264", "-bf", "2", "-c:a", "aac"}));
+}
+
+std::string Minute() {
+    return Make("minute.mkv", Join(CountedPictures(60), Beeps(60), kLossless));
+}
+
+/// Slow enough that a test can interfere: many large pictures, but none that a codec keeps for later.
+Args Slowly(const std::string& output) {
+    return {Minute(), output, "--size", "1280x960", "--frame-rate", "100"};
+}
+
+TEST(Program, WritesEveryPictureOnceAndAllSound) {
+    const Folder folder;
+    const Result result = Call({Counted(), folder / "out.mp4", "--video-rate", "2M"});
+    ASSERT_EQ(result.code, 0) << result.err;
+    EXPECT_EQ(result.err, "");
+    EXPECT_NE(result.out.find("100% done"), std::string::npos) << result.out;
+    EXPECT_EQ(result.out.find('\r'), std::string::npos);
+    EXPECT_EQ(folder.Names(), Args{"out.mp4"});
+
+    movieconv::Movie movie(folder / "out.mp4", {});
+    EXPECT_EQ(movie.Info().pictures->codec, "mpeg4");
+    EXPECT_EQ(movie.Info().sound->codec, "aac");
+    EXPECT_NEAR(movie.Info().duration, 4, 0.04);
+    const Seen seen = TakeAll(movie);
+    ASSERT_EQ(seen.pictures.size(), 100u);
+    for (int i = 0; i < 100; ++i) {
+        EXPECT_NEAR(seen.pictures[i].luma, LumaOf(i), 3) << i;
+        EXPECT_NEAR(seen.pictures[i].time, i / 25.0, 0.001) << i;
+    }
+    EXPECT_GE(seen.sound.size(), 4u * 44100 - 441);
+    EXPECT_LE(seen.sound.size(), 4u * 44100 + 1024);
+}
+
+TEST(Program, KeepsSoundAndPicturesInStep) {
+    struct {
+        Args options;
+        std::size_t files, pictures, flashes;
+    } const cases[] = {{{"--progress", "none"}, 1, 200, 8},
+                       {{"--begin", "2.5", "--length", "4"}, 1, 101, 4},
+                       {{"--split", "2.4"}, 4, 200, 8}};
+    for (const auto& test : cases) {
+        SCOPED_TRACE(test.options[0]);
+        const Folder folder;
+        const Result result = Call(Join(Args{Flashing(), folder / "out.mp4"}, test.options));
+        ASSERT_EQ(result.code, 0) << result.err;
+        EXPECT_GE(folder.Names().size(), test.files);
+        std::size_t pictures = 0;
+        std::size_t flashes = 0;
+        for (const std::string& name : folder.Names()) {
+            movieconv::Movie movie(folder / name, {});
+            const Seen seen = TakeAll(movie);
+            const std::vector<double> light = Flashes(seen);
+            const std::vector<double> sound = Beginnings(seen, movie.Info().sound->sampleRate);
+            ASSERT_EQ(light.size(), sound.size()) << name;
+            for (std::size_t i = 0; i < light.size(); ++i)
+                EXPECT_NEAR(light[i], sound[i], 0.025) << name << ", flash " << i;
+            pictures += seen.pictures.size();
+            flashes += light.size();
+        }
+        EXPECT_EQ(pictures, test.pictures);
+        EXPECT_EQ(flashes, test.flashes);
+    }
+    const Folder folder;
+    const Args slowly = Join(CountedPictures(4), Beeps(4), Args{"-r", "2"}, kLossless); // begin clips late
+    const Result slow = Call({Make("slow.mkv", slowly), folder / "slow.mp4", "--split", "1"});
+    EXPECT_EQ(slow.code, 0) << slow.err;
+}
+
+struct Odd {
+    const char* name;
+    Args making;
+    const char* output;
+    std::size_t pictures;
+    double sound; // seconds
+    Args options = {};
+};
+
+void PrintTo(const Odd& odd, std::ostream* out) {
+    *out << odd.name << " to " << odd.output;
+    for (const std::string& option : odd.options)
+        *out << ' ' << option;
+}
+
+class ProgramTakes : public testing::TestWithParam<Odd> {};
+
+TEST_P(ProgramTakes, AndConvertsAll) {
+    const Odd& odd = GetParam();
+    const Folder folder;
+    const std::string source = Make(std::string("odd-") + odd.name, odd.making);
+    const Result result = Call(Join(Args{source, folder / odd.output}, odd.options));
+    ASSERT_EQ(result.code, 0) << result.err;
+    movieconv::Movie movie(folder / odd.output, {});
+    const Seen seen = TakeAll(movie);
+    EXPECT_EQ(seen.pictures.size(), odd.pictures);
+    const double seconds =
+        movie.Info().sound ? static_cast<double>(seen.sound.size()) / movie.Info().sound->sampleRate : 0;
+    EXPECT_NEAR(seconds, odd.sound, odd.sound > 0 ? 0.06 : 0);
+}
+
+Args Lossless(double pictureSeconds, double soundSeconds) {
+    return Join(CountedPictures(pictureSeconds), Beeps(soundSeconds), kLossless);
+}
+
+const Args kVariable = Join(CountedPictures(4), Args{"-vf", "select='lt(mod(n,6),3)'", "-fps_mode", "vfr"});
+const Args kStill = Join(CountedPictures(14), Beeps(14), Args{"-vf", "select='lt(n,1)+gt(n,250)'"},
+                         Args{"-fps_mode", "vfr"}, kLossless);
+const Args kFast = Join(CountedPictures(1, "240"), Args{"-c:v", "libx264"});
+const Args kMilliseconds = Join(CountedPictures(1), Args{"-enc_time_base", "1/1000", "-fps_mode", "vfr"},
+                                Args{"-vf", "settb=1/1000", "-c:v", "mjpeg"});
+const Args kSmall{"--size",        "80x80", "--frame-rate",     "12.5",
+                  "--video-codec", "avc1",  "--video-max-rate", "1M"};
+
+// A part has the picture shown at its begin, and those that begin before its end.
+const Odd kOddities[] = {
+    {"size.mkv", Join(CountedPictures(1), Args{"-vf", "scale=161:121", "-c:v", "ffv1"}), "o.mp4", 25, 0},
+    {"one.mp4", Join(CountedPictures(0.04), Args{"-c:v", "libx264"}), "o.mp4", 1, 0},
+    {"short-sound.mkv", Lossless(3, 1), "o.mp4", 75, 3},
+    {"long-sound.mkv", Lossless(1, 3), "o.mp4", 25, 3},
+    {"still.mkv", kStill, "o.flv", 100, 14},
+    {"variable.mp4", kVariable, "o.avi", 100, 0},
+    {"fast.mkv", kFast, "o.mp4", 30, 0}, // a rate that the engine brings down to 30
+    {"milliseconds.avi", kMilliseconds, "o.avi", 25, 0},
+    {"plain.mkv", Lossless(2, 2), "o.mkv", 50, 0, {"--no-audio"}},
+    {"plain.mkv", Lossless(2, 2), "o.mp3", 0, 2, {"--no-video"}},
+    {"plain.mkv", Lossless(2, 2), "o.mkv", 2, 1.6, {"--length", "1.6", "--frame-rate", "1"}},
+    {"plain.mkv", Lossless(2, 2), "o.webm", 26, 1, {"--begin", "0.5", "--length", "1"}},
+    {"plain.mkv", Lossless(2, 2), "o.ts", 25, 2, kSmall},
+    {"plain.mkv", Lossless(2, 2), "o.mov", 50, 2},
+};
+INSTANTIATE_TEST_SUITE_P(Sources, ProgramTakes, testing::ValuesIn(kOddities));
+
+TEST(Program, TakesNamesInAnyScript) {
+    const Folder folder;
+    const std::string dashed = folder / "-y";
+    fs::copy_file(Counted(), dashed);
+    const Args names{"фильм 映画.mp4",   "it's 100%d \"quoted\".tar.mp4", "[a,b].mp4",
+                     "\xff\xfe raw.mp4", "file:http:movie.mp4",           std::string(248, 'n') + ".mp4"};
+    for (const std::string& name : names) {
+        const Result result = Call({"--length", "0.4", "--split", "0.2", "--", dashed, folder / name});
+        EXPECT_EQ(result.code, 0) << name << ": " << result.err;
+        const std::string stem = name.substr(0, name.rfind('.'));
+        EXPECT_TRUE(fs::exists(folder / (stem + "_00.mp4"))) << name;
+        EXPECT_TRUE(fs::exists(folder / (stem + "_01.mp4"))) << name;
+    }
+}
+
+TEST(Program, RefusesAndLeavesEverythingAsItWas) {
+    const Folder folder;
+    const std::string source = folder / "in.mkv";
+    fs::copy_file(Counted(), source);
+    fs::create_hard_link(source, folder / "same.mkv");
+    fs::create_symlink("nothing.mkv", folder / "link.mkv");
+    fs::create_symlink("there.mp4", folder / "linked");
+    WriteFile(folder / "there.mp4", "precious");
+    WriteFile(folder / "clip_03.mp4", "precious");
+    WriteFile(folder / "text.srt", "1\n00:00:00,000 --> 00:00:01,000\nWords alone.\n");
+    WriteFile(folder / "text.ans", "Words alone.\n");
+    WriteFile(folder / "text.ffconcat", "ffconcat version 1.0\nfile in.mkv\n");
+    WriteFile(folder / "network.sdp", "v=0\nc=IN IP4 127.0.0.1\nm=video 5004 RTP/AVP 33\n");
+    const std::string whole = ReadFile(
+        Make("index-first.mp4", Join(CountedPictures(1), Beeps(1), Args{"-movflags", "+faststart"})));
+    WriteFile(folder / "head.mp4", whole.substr(0, whole.find("mdat") + 4)); // opens, but holds nothing
+    WriteFile(folder / "body.mp4", whole.substr(whole.find("mdat") - 4));
+    const std::vector<std::string> before = folder.Names();
+    const struct {
+        Args arguments;
+        int code;
+        const char* word;
+    } refusals[] = {
+        {{source, source, "-y"}, 2, "source itself"},
+        {{source, folder / "same.mkv", "-y"}, 2, "source itself"},
+        {{source, folder / "out.mkv", "--preview", folder / "same.mkv"}, 2, "is the source"},
+        {{source, folder / "out.mkv", "--log", folder / "out.mkv.part"}, 2, "is the output"},
+        {{source, folder / "clip.mkv", "--split", "1", "--log", folder / "clip_100.mkv"}, 2, "is the output"},
+        {{source, folder / "out.mkv", "--log", folder / "x", "--preview", folder / "x"}, 2, "the same file"},
+        {{source, folder / "out.mkv", "--preview", folder / "there.mp4"}, 4, "not a preview"},
+        {{source, folder / "out.mkv", "--preview", folder / "linked", "-y"}, 4, "a symbolic link"},
+        {{source, folder / "out.mkv", "--preview", "/dev/null", "-y"}, 4, "a device"},
+        {{source, folder / "out.mkv", "--log", folder / "there.mp4"}, 4, "not a log"},
+        {{"--list-formats", "--log", folder / "link.mkv", "-y"}, 4, "a symbolic link"},
+        {{source, folder / "out.mkv", "--log", "/dev/full", "-y"}, 4, "a device"},
+        {{source, folder / "link.mkv", "-y"}, 4, "a link to a missing file"},
+        {{source, folder / "there.mp4"}, 4, "--overwrite"},
+        {{source, folder / "clip.mp4", "--split", "1"}, 4, "clip_03.mp4"},
+        {{source, folder / "clip", "--split", "1", "-f", "mp4"}, 2, "extension"},
+        {{source, folder / (std::string(249, 'n') + ".mp4"), "--split", "1"}, 4, "too long"},
+        {{source, folder / (std::string(245, 'n') + ".mp4"), "--split", "0.1"}, 4, "too long"}, // many clips
+        {{source, folder / (std::string(500, '/') + std::string(15, 'n') + ".mp4"), "--split", "1"},
+         2,
+         "too long"},
+        {{source, folder / (std::string(252, 'n') + ".mp4")}, 4, "too long"},
+        {{source, folder / "out.mp4", "--preview", folder / (std::string(248, 'n') + ".png")}, 4, "too long"},
+        {{source, folder / "out.mp3", "--split", "1"}, 2, "needs pictures"},
+        {{source, folder / "out.mp4", "--split", "0.01"}, 2, "--split takes"},
+        {{source, folder / "out.mp4", "--length", "0"}, 2, "at least 0.001"},
+        {{source, folder / "out.mp4", "--length", "9999999999"}, 2, "is not a time"},
+        {{source, folder / "there.mp4/out.mp4"}, 4, "is not a folder"},
+        {{"--estimate", source, folder / "nowhere/out.mp4"}, 4, "nowhere"},
+        {{source, folder / "nowhere/out.mp4"}, 4, "nowhere"},
+        {{source, "/proc/out.mp4"}, 4, "/proc"}, // where not even the superuser can create a file
+        {{source, folder.Path(), "-f", "mp4"}, 4, "is a folder"},
+        {{source, "/dev/null", "-f", "mp4", "-y"}, 4, "not a file"},
+        {{folder.Path(), folder / "out.mp4"}, 3, "directory"},
+        {{source, folder / "out.xyz"}, 2, "--format"},
+        {{source, folder / "out"}, 2, "--format"},
+        {{folder / "body.mp4", folder / "out.mp4"}, 3, "index"},
+        {{source, folder / "out.mp4", "--log", folder / "nowhere/log"}, 4, "nowhere/log"},
+        {{folder / "none.mkv", folder / "out.mp4"}, 3, "none.mkv"},
+        {{folder / "there.mp4", folder / "out.mp4"}, 3, "there.mp4"},
+        {{folder / "text.srt", folder / "out.mp4"}, 3, "no pictures and no sound"},
+        {{folder / "text.ans", folder / "out.mp4"}, 3, "it is a text"},
+        {{folder / "network.sdp", folder / "out.mp4"}, 3, "where to find one"},
+        {{folder / "text.ffconcat", folder / "out.mp4"}, 3, "--allow-playlists"},
+        {{folder / "head.mp4", folder / "there.mp4", "-y"}, 3, "nothing to convert"},
+        {{source, folder / "out.mp4", "--begin", "9"}, 2, "--begin"},
+        {{source, folder / "out.mp4", "--fit", "wide"}, 2, "\"wide\" is not borders|stretch"},
+        {{"none.mkv", folder / "out.webm", "--video-codec", "XVID"}, 2, "cannot carry pictures as \"XVID\""},
+        {{"none.mkv", folder / "out.ts", "--audio-codec", "what"}, 2, "cannot carry sound as \"WHAT\""},
+        {{source, folder / "out.mp3", "--video-codec", "H264"}, 2, "cannot carry pictures"},
+        {{source, folder / "out.mp4", "--video-codec", "H.264"}, 2, "four characters"},
+        {{source, folder / "out.mp4", "--no-video", "--no-audio"}, 2, "--no-audio"},
+        {{source, folder / "out.mp3", "--no-audio"}, 2, "MP3"},
+        {{source, folder / "out.mp4", "--frame-rate", "240"}, 2, "up to 200"},
+        {{source}, 2, "OUTPUT"},
+        {{}, 2, "INPUT"},
+        {{"--nonsense"}, 2, "--help"},
+    };
+    for (const auto& refusal : refusals) {
+        const Result result = Call(refusal.arguments);
+        EXPECT_EQ(result.code, refusal.code) << result.err;
+        EXPECT_NE(result.err.find(refusal.word), std::string::npos) << result.err;
+        EXPECT_EQ(folder.Names(), before) << result.err;
+    }
+    EXPECT_EQ(ReadFile(folder / "there.mp4"), "precious");
+    EXPECT_EQ(ReadFile(source), ReadFile(Counted()));
+    EXPECT_EQ(Call({source, folder / "there.mp4", "-y"}).code, 0);
+    EXPECT_GT(fs::file_size(folder / "there.mp4"), 1000u);
+}
+
+TEST(Program, PrintsValidJsonAndNothingElse) {
+    const Folder folder;
+    const Result result = Call({Counted(), folder / "a \"b\"\n\xff.mp4", "--progress", "json", "--split", "2",
+                                "--log", folder / "log"});
+    ASSERT_EQ(result.code, 0) << result.err;
+    EXPECT_EQ(result.err, "");
+    WriteFile(folder / "events", result.out);
+    const char* check =
+        "import json, sys\n"
+        "events = [json.loads(line) for line in open(sys.argv[1], encoding='utf-8', newline='\\n')]\n"
+        "kinds = [e['event'] for e in events]\n"
+        "assert all(e['v'] == 1 for e in events)\n"
+        "assert kinds[0] == 'start' and kinds[-1] == 'end'\n"
+        "assert kinds.count('clip_opened') == kinds.count('clip_closed') >= 2\n"
+        "assert events[-1]['exit_code'] == 0 and events[-1]['outcome'] == 'done'\n"
+        "last = len(kinds) - kinds[::-1].index('clip_closed')\n"
+        "assert all(e['phase'] == 'finishing' for e in events[last:-1])\n"
+        "assert all(e['percent'] < 100 for e in events if e['event'] == 'progress')\n";
+    EXPECT_EQ(program::Run({"python3", "-c", check, folder / "events"}).code, 0) << result.out;
+    EXPECT_NE(ReadFile(folder / "log").find("Encoding thread Exit."), std::string::npos);
+}
+
+TEST(Program, KeepsAPreview) {
+    const Folder folder;
+    for (const Args& options : {Args{}, Args{"--no-audio"}, Args{"--length", "0.5"}}) {
+        const Args preview{Counted(), folder / "out.mp4", "-y", "--preview", folder / "now.png"};
+        ASSERT_EQ(Call(Join(preview, options)).code, 0);
+        const Seen seen = LookAt(folder / "now.png");
+        ASSERT_EQ(seen.pictures.size(), 1u);
+        EXPECT_EQ(seen.pictures[0].width, 160);
+        EXPECT_NEAR(seen.pictures[0].luma, LumaOf(options.size() < 2 ? 99 : 12), 2);
+        WriteFile(folder / "there.png", "precious"); // replaced by leave only, a preview of before without
+        EXPECT_EQ(Call({Counted(), folder / "out.mp4", "-y", "--preview", folder / "there.png"}).code, 0);
+        EXPECT_EQ(LookAt(folder / "there.png").pictures.size(), 1u);
+    }
+
+    Running running(
+        Join(Slowly(folder / "slow.mp4"), Args{"--progress", "json", "--preview", folder / "now.png"}),
+        false);
+    ASSERT_TRUE(running.WaitFor("clip_opened"));
+    const auto before = fs::last_write_time(folder / "now.png");
+    while (fs::last_write_time(folder / "now.png") == before)
+        std::this_thread::sleep_for(std::chrono::milliseconds(5));
+    WriteFile(folder / "precious", "precious");
+    fs::rename(folder / "precious", folder / "now.png");
+    running.Signal(SIGINT); // the last picture is shown, too
+    const Result result = running.Finish();
+    EXPECT_EQ(result.code, 6) << result.out;
+    EXPECT_NE(result.out.find("another file has come there meanwhile"), std::string::npos) << result.out;
+    EXPECT_EQ(ReadFile(folder / "now.png"), "precious");
+    EXPECT_EQ(folder.Names(), (Args{"now.png", "out.mp4", "slow.mp4", "there.png"}));
+
+    const Result without =
+        Call({Counted(), folder / "out.mkv", "--preview", folder / "nowhere/now.png", "--progress", "none"});
+    EXPECT_EQ(without.code, 0);
+    EXPECT_NE(without.err.find("nowhere/now.png\": No such file"), std::string::npos) << without.err;
+    EXPECT_EQ(without.out.find("100% done"), 0u) << without.out;
+}
+
+TEST(Program, TellsAboutSourcesFormatsAndRoom) {
+    const Folder folder;
+    const Result info = Call({"--info", Counted()});
+    EXPECT_EQ(info.code, 0);
+    EXPECT_NE(info.out.find("160 x 120"), std::string::npos) << info.out;
+    const Result estimate = Call({"--estimate", Counted(), "out.mp4"});
+    EXPECT_EQ(estimate.code, 0) << estimate.err;
+    EXPECT_NE(estimate.out.find("320.0 kB"), std::string::npos) << estimate.out; // 640 kbit/s for 4 s
+    EXPECT_NE(estimate.out.find("are free in \".\""), std::string::npos) << estimate.out;
+    EXPECT_NE(Call({"--list-formats"}).out.find("MKV"), std::string::npos);
+    EXPECT_NE(Call({"--help"}).out.find("--split"), std::string::npos);
+    EXPECT_NE(Call({"--version"}).out.find("movieconv 1."), std::string::npos);
+}
+
+TEST(Program, VersionTellsTheColourRoutinesLevel) {
+    const auto version = [](const std::string& wanted) {
+        return program::Run({"env", "MOVIECONV_COLOUR_LEVEL=" + wanted, MOVIECONV_PROGRAM, "--version"}).out;
+    };
+    EXPECT_NE(version("plain").find("\ncolour routines: plain\n"), std::string::npos) << version("plain");
+    EXPECT_NE(version("fast").find("\"fast\", which is not to be had"), std::string::npos) << version("fast");
+}
+
+TEST(Program, GetsAlongWithWhateverStandardStreams) {
+    const Folder folder;
+    const std::string raw = Make("raw.mpv", Join(CountedPictures(1), Args{"-f", "mpeg2video"}));
+    const auto shell = [&](const std::string& command) {
+        return program::Run({"sh", "-c", "movieconv() { '" MOVIECONV_PROGRAM "' \"$@\"; }; " + command, raw,
+                             folder / "out.mp4"});
+    };
+    EXPECT_EQ(shell("movieconv \"$0\" \"$1\" <&- >&- 2>&-").code, 0);
+    EXPECT_EQ(LookAt(folder / "out.mp4").pictures.size(), 25u);
+    EXPECT_EQ(shell("movieconv --list-formats >/dev/full").code, 4);
+    EXPECT_NE(shell("cat \"$0\" | movieconv --info /dev/stdin").out.find("length unknown"),
+              std::string::npos);
+    EXPECT_EQ(shell("cat \"$0\" | movieconv --estimate /dev/stdin \"$1\"").code, 2);
+}
+
+TEST(Program, AppendsToItsOwnLogsAndByLeaveToOthers) {
+    const Folder folder;
+    const auto call = [&](const std::string& log, const char* leave) {
+        return Call({Counted(), folder / "out.mp4", leave, "--length", "0.2", "--log", folder / log}).code;
+    };
+    WriteFile(folder / "empty", "");
+    WriteFile(folder / "letter", "Dear reader,\n");
+    EXPECT_EQ(call("log", "-q"), 0);
+    const std::string first = ReadFile(folder / "log");
+    for (const char* log : {"log", "empty", "letter"})
+        EXPECT_EQ(call(log, "-y"), 0);
+    EXPECT_EQ(ReadFile(folder / "log").find(first), 0u);
+    EXPECT_GT(ReadFile(folder / "log").size(), first.size());
+    EXPECT_EQ(ReadFile(folder / "empty").find("movieconv log\n"), 0u);
+    EXPECT_EQ(ReadFile(folder / "letter").find("Dear reader,\n"), 0u);
+    EXPECT_NE(ReadFile(folder / "letter").find("Encoding thread Exit."), std::string::npos);
+}
+
+class ProgramSignal : public testing::TestWithParam<int> {};
+
+TEST_P(ProgramSignal, FinishesAPlayableFile) {
+    const Folder folder;
+    Running running(Join(Slowly(folder / "out.mp4"), Args{"--progress", "json"}), false);
+    for (int report = 0; report < 4; ++report)
+        ASSERT_TRUE(running.WaitFor("\"event\":\"progress\""));
+    running.Signal(GetParam());
+    const Result result = running.Finish();
+    EXPECT_EQ(result.code, 6) << result.out;
+    EXPECT_NE(result.out.find("\"outcome\":\"stopped\""), std::string::npos);
+    EXPECT_EQ(folder.Names(), Args{"out.mp4"});
+    // What the full queues held is in the file, too.
+    EXPECT_EQ(result.out.find("\"event\":\"warning\""), std::string::npos) << result.out;
+    const std::string told = "\"video_s\":";
+    const std::size_t at = result.out.rfind(told);
+    ASSERT_NE(at, std::string::npos) << result.out;
+    const double seconds = std::atof(&result.out[at + told.size()]);
+    EXPECT_GT(seconds, 0);
+    EXPECT_LT(seconds, 60);
+    EXPECT_NEAR(static_cast<double>(LookAt(folder / "out.mp4").pictures.size()), seconds * 100, 1);
+}
+
+INSTANTIATE_TEST_SUITE_P(Signals, ProgramSignal, testing::Values(SIGINT, SIGTERM));
+
+TEST(Program, LeavesAtOnceOnASignalWellAfterTheFirst) {
+    const Folder folder;
+    Running running(Join(Slowly(folder / "out.mp4"), Args{"--progress", "json"}), false);
+    ASSERT_TRUE(running.WaitFor("\"position_s\":[1-9]"));
+    running.Jam(); // so that it cannot come to an end by itself
+    while (!running.HasEnded()) {
+        running.Signal(SIGTERM);
+        std::this_thread::sleep_for(std::chrono::milliseconds(10));
+    }
+    EXPECT_EQ(running.Finish().code, 128 + SIGTERM);
+}
+
+TEST(Program, TakesTwoSignalsAtOnceForOne) {
+    const Folder folder;
+    Running running(Join(Slowly(folder / "out.mp4"), Args{"--progress", "json"}), false);
+    ASSERT_TRUE(running.WaitFor("\"position_s\":[1-9]"));
+    running.Signal(SIGSTOP);
+    ASSERT_TRUE(running.WaitUntilSuspended());
+    for (const int signal : {SIGINT, SIGTERM, SIGCONT})
+        running.Signal(signal);
+    EXPECT_EQ(running.Finish().code, 6);
+    EXPECT_EQ(folder.Names(), Args{"out.mp4"});
+}
+
+TEST(Program, GoesOnIgnoringWhatItsCallerIgnores) {
+    const Folder folder;
+    for (const int signal : {SIGHUP, SIGINT, SIGTERM}) {
+        const auto usual = std::signal(signal, SIG_IGN); // which the program inherits
+        Running running({Counted(), folder / "out.mp4", "-y", "--progress", "json"}, false);
+        std::signal(signal, usual);
+        ASSERT_TRUE(running.WaitFor("clip_opened"));
+        running.Jam();
+        running.Signal(signal);
+        running.Signal(signal);
+        const Result result = running.Finish();
+        EXPECT_EQ(result.code, 0) << result.out;
+        EXPECT_EQ(LookAt(folder / "out.mp4").pictures.size(), 100u);
+    }
+}
+
+TEST(Program, FollowsKeysAndLeavesTheTerminalWhileItIsSuspended) {
+    using Clock = std::chrono::steady_clock;
+    constexpr std::chrono::seconds kSuspended{2};
+    const Folder folder;
+    const Clock::time_point begin = Clock::now();
+    Running running(Slowly(folder / "out.mp4"), true);
+    ASSERT_TRUE(running.WaitFor("0:00:0[1-9] / "));
+    running.Press(" ");
+    ASSERT_TRUE(running.WaitFor("paused"));
+    running.Press("p");
+    ASSERT_TRUE(running.WaitFor("left"));
+    EXPECT_FALSE(running.Echoes());
+    running.Press("\x1a");
+    ASSERT_TRUE(running.WaitUntilSuspended());
+    EXPECT_TRUE(running.Echoes());
+    ASSERT_TRUE(running.WaitFor("\r\n")); // it left its line
+    std::this_thread::sleep_for(kSuspended);
+    running.Signal(SIGCONT);
+    ASSERT_TRUE(running.WaitFor("left"));
+    EXPECT_FALSE(running.Echoes());
+    running.Press("q");
+    const Result result = running.Finish();
+    EXPECT_EQ(result.code, 6) << result.out;
+    EXPECT_GT(LookAt(folder / "out.mp4").pictures.size(), 0u);
+    const std::chrono::duration<double> most = Clock::now() - begin - kSuspended;
+    const std::size_t told = result.out.find("converted in 0:");
+    ASSERT_NE(told, std::string::npos) << result.out;
+    int minutes = 0;
+    double seconds = 0;
+    ASSERT_EQ(std::sscanf(&result.out[told], "converted in 0:%d:%lf", &minutes, &seconds), 2) << result.out;
+    EXPECT_LT(minutes * 60 + seconds, most.count());
+}
+
+class ProgramStalls : public testing::TestWithParam<const char*> {};
+
+TEST_P(ProgramStalls, AndStops) {
+    const bool beforeTheBegin = GetParam() != std::string("0");
+    const Folder folder;
+    const std::string pipe = folder / "pipe";
+    ASSERT_EQ(mkfifo(pipe.c_str(), 0600), 0);
+    const int end = open(pipe.c_str(), O_RDWR | O_CLOEXEC); // waits for nobody, and lets nobody see an end
+    const std::string movie = ReadFile(
+        Make("streamed.ts", Join(CountedPictures(8), Beeps(8), Args{"-c:v", "mpeg2video", "-c:a", "mp2"})));
+    ASSERT_GE(fcntl(end, F_SETPIPE_SZ, 1 << 20), static_cast<int>(movie.size()));
+    const std::size_t half = movie.size() / 2;
+    ASSERT_EQ(write(end, movie.data(), half), static_cast<ssize_t>(half));
+    Running running({pipe, folder / "out.mp4", "--progress", "json", "--begin", GetParam()}, false);
+    EXPECT_TRUE(running.WaitFor(beforeTheBegin ? "clip_opened" : "\"position_s\":[3-9]"));
+    running.Signal(SIGINT);
+    const Result result = running.Finish();
+    close(end);
+    EXPECT_EQ(result.code, 6) << result.out;
+    EXPECT_EQ(folder.Names(), beforeTheBegin ? Args{"pipe"} : (Args{"out.mp4", "pipe"}));
+    EXPECT_TRUE(beforeTheBegin || LookAt(folder / "out.mp4").pictures.size() > 70);
+}
+
+INSTANTIATE_TEST_SUITE_P(Begins, ProgramStalls, testing::Values("0", "6"));
+
+TEST(Program, WritesTheSameFileWhateverThePauses) {
+    const Folder folder;
+    const Args encoding{"--length", "3", "--size", "640x480"};
+    ASSERT_EQ(Call(Join(Args{Flashing(), folder / "steady.mp4"}, encoding)).code, 0);
+    Running running(Join(Args{Flashing(), folder / "paused.mp4"}, encoding), true);
+    for (int i = 0; i < 6; ++i) {
+        running.Press(" ");
+        std::this_thread::sleep_for(std::chrono::milliseconds(10 + 17 * i % 50));
+    }
+    EXPECT_EQ(running.Finish().code, 0);
+    EXPECT_EQ(ReadFile(folder / "steady.mp4"), ReadFile(folder / "paused.mp4"));
+}
+
+TEST(Program, KeepsWhatIsDoneOnAFullDiskRemovesItOrWaits) {
+    const Folder folder;
+    const SmallDisk disk(folder / "disk", "600k");
+    if (!disk.IsThere())
+        GTEST_SKIP() << "no small disk can be mounted here";
+    const Args making{Minute(), folder / "disk/out.mov", "--audio-codec", "PCM"};
+    const Result result = Call(making);
+    EXPECT_EQ(result.code, 5) << result.err;
+    EXPECT_NE(result.err.find("out.mov"), std::string::npos);
+    EXPECT_FALSE(fs::exists(folder / "disk/out.mov"));
+    const std::vector<std::string> left = folder.Names("disk");
+    ASSERT_EQ(left.size(), 1u);
+    EXPECT_NE(result.err.find(left[0]), std::string::npos) << result.err;
+    EXPECT_GT(LookAt(folder / "disk/" + left[0]).pictures.size(), 25u);
+
+    fs::remove(folder / "disk/" + left[0]);
+    const Result quiet = Call(Join(making, Args{"--no-keep-partial", "--quiet"}));
+    EXPECT_EQ(quiet.code, 5);
+    EXPECT_EQ(quiet.out, "");
+    EXPECT_TRUE(folder.Names("disk").empty());
+
+    Running waiting(Join(making, Args{"--on-full", "wait", "--progress", "json"}), false);
+    ASSERT_TRUE(waiting.WaitFor("waiting_for_room"));
+    ASSERT_TRUE(disk.Grow());
+    const Result whole = waiting.Finish();
+    EXPECT_EQ(whole.code, 0) << whole.out;
+    EXPECT_EQ(LookAt(folder / "disk/out.mov").pictures.size(), 1500u);
+}
+
+TEST(Program, ConvertsAllAlthoughTheLogCannotBeWritten) {
+    const Folder folder;
+    const SmallDisk disk(folder / "disk", "600k");
+    if (!disk.IsThere())
+        GTEST_SKIP() << "no small disk can be mounted here";
+    WriteFile(folder / "disk/much", std::string(1'000'000, 'x'));
+    const Result result = Call({Counted(), folder / "out.mp4", "--log", folder / "disk/log"});
+    EXPECT_EQ(result.code, 0) << result.err;
+    EXPECT_EQ(LookAt(folder / "out.mp4").pictures.size(), 100u);
+    EXPECT_EQ(ReadFile(folder / "disk/log"), "");
+}
+
+} // namespace

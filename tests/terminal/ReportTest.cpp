@@ -1,0 +1,33 @@
+#include "host/terminal/JsonReporter.h"
+#include "host/terminal/TextReporter.h"
+
+#include <gtest/gtest.h>
+
+namespace {
+
+using namespace movieconv;
+
+TEST(ProgressText, FitsTheTerminalAndNeverRoundsUp) {
+    Progress report;
+    report.percent = 42.99;
+    report.position = 61;
+    report.length = 3600;
+    report.speed = 3.5;
+    report.left = 59.2;
+    report.bytes = 1'234'567;
+    const std::string text = ProgressText(report, 1000);
+    EXPECT_EQ(text, " 42.9%  0:01:01 / 1:00:00   3.50x  left 0:01:00  1.2 MB");
+    for (int columns = 10; columns < 60; ++columns)
+        EXPECT_LT(ProgressText(report, columns).size(), static_cast<std::size_t>(columns));
+    report.percent.reset();
+    EXPECT_EQ(ProgressText(report, 1000).find('%'), std::string::npos);
+    report.phase = Phase::kWaitingForRoom;
+    EXPECT_NE(ProgressText(report, 1000).find("disk full, waiting"), std::string::npos);
+}
+
+TEST(JsonString, EscapesWhatJsonDoesNotTake) {
+    EXPECT_EQ(JsonString("a\"b\\c\n\x01"), "\"a\\\"b\\\\c\\u000a\\u0001\"");
+    EXPECT_EQ(JsonString("ф\xff"), "\"ф\xEF\xBF\xBD\"");
+}
+
+} // namespace

@@ -1,0 +1,157 @@
+// The queue on the disk.
+#include "host/window/model/Journal.h"
+#include "tests/support/Folder.h"
+#include "tests/support/Process.h"
+#include "tests/window/ScriptedRunner.h"
+
+#include <gtest/gtest.h>
+
+#include <atomic>
+#include <csignal>
+#include <filesystem>
+
+using namespace movieconv::window;
+
+namespace {
+
+void Ignore(const QString&) {}
+
+std::vector<Entry> Load(const std::string& path) {
+    QString complaint;
+    return Journal(path, Ignore).Load(complaint);
+}
+
+Entry FullEntry() {
+    Entry entry;
+    entry.source = "/movies/a b%\xFF\"\n.mkv";
+    entry.target = "/out/ä.mp4";
+    entry.targetNamed = entry.replace = true;
+    entry.state = State::kDone;
+    entry.wishes = {.preset = "web",
+                    .format = "webm",
+                    .quality = 40,
+                    .height = 720,
+                    .rate = 29.97,
+                    .begin = 1.5,
+                    .end = 90,
+                    .clip = 30,
+                    .sounds = QList<int>{2, 1},
+                    .subtitles = QList<int>{},
+                    .channels = 1,
+                    .deinterlace = Wishes::Deinterlace::kAll,
+                    .crop = true,
+                    .withPictures = true,
+                    .withSound = false};
+    entry.outcome = {.ending = Ending::kDone,
+                     .sentence = "well",
+                     .files = {"/out/ä.mp4", "/out/\xFF"},
+                     .notCarried = {"a cover"},
+                     .bytes = 123'456'789'012,
+                     .position = 88.5,
+                     .worked = 9};
+    entry.notes = QStringList{"12:00:00  a note"};
+    return entry;
+}
+
+} // namespace
+
+TEST(Journal, KeepsEverythingOfAnEntry) {
+    const Folder folder;
+    const Entry entry = FullEntry();
+    Journal(folder / "queue", Ignore).Keep({entry});
+    const std::vector<Entry> loaded = Load(folder / "queue");
+    ASSERT_EQ(loaded.size(), 1U);
+    EXPECT_EQ(loaded[0].source, entry.source);
+    EXPECT_EQ(loaded[0].target, entry.target);
+    EXPECT_TRUE(loaded[0].targetNamed && loaded[0].replace);
+    EXPECT_EQ(loaded[0].state, State::kDone);
+    EXPECT_EQ(loaded[0].wishes, entry.wishes);
+    EXPECT_EQ(loaded[0].outcome.ending, Ending::kDone);
+    EXPECT_EQ(loaded[0].outcome.sentence, entry.outcome.sentence);
+    EXPECT_EQ(loaded[0].outcome.files, entry.outcome.files);
+    EXPECT_EQ(loaded[0].outcome.notCarried, entry.outcome.notCarried);
+    EXPECT_EQ(loaded[0].outcome.bytes, entry.outcome.bytes);
+    EXPECT_EQ(loaded[0].outcome.position, 88.5);
+    EXPECT_EQ(loaded[0].notes, entry.notes);
+}
+
+TEST(Journal, BringsBackEachStateAndWhatWasActiveAsInterrupted) {
+    const Folder folder;
+    std::vector<Entry> entries;
+    for (int state = 0; state <= static_cast<int>(State::kInterrupted); ++state) {
+        entries.emplace_back();
+        entries.back().source = "/m";
+        entries.back().state = static_cast<State>(state);
+    }
+    Journal(folder / "queue", Ignore).Keep(entries);
+    const std::vector<Entry> loaded = Load(folder / "queue");
+    ASSERT_EQ(loaded.size(), entries.size());
+    for (size_t i = 0; i < loaded.size(); ++i) {
+        const State state = entries[i].state;
+        EXPECT_EQ(loaded[i].state, state == State::kActive ? State::kInterrupted : state);
+    }
+}
+
+TEST(Journal, SetsAsideWhatItCannotRead) {
+    for (const char* text : {"", "{", "[]", "{\"version\":99,\"entries\":[]}", "\xFF\xFE"}) {
+        const Folder folder;
+        WriteFile(folder / "queue", text);
+        QString complaint;
+        EXPECT_TRUE(Journal(folder / "queue", Ignore).Load(complaint).empty());
+        EXPECT_TRUE(complaint.contains(QStringLiteral("queue.unreadable"))) << text;
+        EXPECT_EQ(ReadFile(folder / "queue.unreadable"), text);
+    }
+    const Folder folder;
+    WriteFile(folder / "queue", R"({"version":1,"entries":[5,{},{"source":"/a","state":"odd"},
+        {"source":"/b","state":"waiting","wishes":{"quality":"high","height":-3,"begin":"x","sounds":7}}]})");
+    const std::vector<Entry> loaded = Load(folder / "queue");
+    ASSERT_EQ(loaded.size(), 1U);
+    EXPECT_EQ(loaded[0].source, "/b");
+    EXPECT_EQ(loaded[0].wishes, Wishes());
+}
+
+TEST(Journal, TellsOnceThatItCannotWriteAndGoesOn) {
+    const Folder folder;
+    std::atomic<int> complaints = 0;
+    Journal journal(folder / "below/queue", [&](const QString& sentence) {
+        EXPECT_TRUE(sentence.contains(QStringLiteral("below/queue")));
+        ++complaints;
+    });
+    for (int i = 0; i < 2; ++i) {
+        journal.Keep({FullEntry()});
+        journal.Settle();
+    }
+    EXPECT_EQ(complaints, 1);
+    std::filesystem::create_directory(folder / "below");
+    journal.Keep({FullEntry()});
+    journal.Settle();
+    EXPECT_EQ(Load(folder / "below/queue").size(), 1U);
+}
+
+TEST(Journal, IsWholeAtWhateverMomentTheProgramIsKilled) {
+    const Folder folder;
+    const std::string path = folder / "queue";
+    std::vector<Entry> entries(300, FullEntry());
+    for (int round = 0; round < 5; ++round) {
+        int ready[2];
+        ASSERT_EQ(pipe(ready), 0);
+        const pid_t child = fork();
+        if (child == 0) {
+            Journal journal(path, Ignore);
+            journal.Keep(entries);
+            journal.Settle();
+            [[maybe_unused]] const ssize_t told = write(ready[1], "x", 1);
+            while (true)
+                journal.Keep(entries);
+        }
+        char told = 0;
+        ASSERT_EQ(read(ready[0], &told, 1), 1);
+        kill(child, SIGKILL);
+        AwaitEnd(child);
+        close(ready[0]);
+        close(ready[1]);
+        QString complaint;
+        EXPECT_EQ(Journal(path, Ignore).Load(complaint).size(), entries.size());
+        EXPECT_TRUE(complaint.isEmpty());
+    }
+}

@@ -1,0 +1,160 @@
+// Real conversions in the window; with a display, pictures of it for people to look at.
+#include "host/window/App.h"
+#include "host/window/runner/ConvertRunner.h"
+#include "host/window/widgets/Look.h"
+#include "host/window/widgets/QueueView.h"
+#include "host/window/widgets/RangeStrip.h"
+#include "host/window/widgets/WorkPage.h"
+#include "tests/support/TestMovies.h"
+#include "tests/window/ScriptedRunner.h"
+
+#include <gtest/gtest.h>
+
+#include <QAction>
+#include <QApplication>
+
+#include <set>
+
+using namespace movieconv::window;
+
+namespace {
+
+struct PicturesTest : testing::Test {
+    Folder folder;
+    ConvertRunner runner;
+    Settings settings{QString::fromStdString(folder / "settings")};
+    App app{runner, settings, folder / "queue"};
+
+    const Entry& At(size_t row) { return app.TheQueue().Entries().at(row); }
+
+    void Act(const char* name) { app.Window().findChild<QAction*>(QLatin1String(name))->trigger(); }
+
+    bool AwaitDone() {
+        return Await([&] { return !app.TheDispatcher().IsWorking(); });
+    }
+
+    void AwaitExamined(size_t count) {
+        ASSERT_TRUE(Await([&] {
+            const auto& entries = app.TheQueue().Entries();
+            return entries.size() == count && std::none_of(entries.begin(), entries.end(), [](auto& entry) {
+                       return entry.IsBeingExamined();
+                   });
+        }));
+    }
+
+    /// Keeps a picture of the window where the caller of the test wants one.
+    void Photograph(const char* name) {
+        const QByteArray place = qgetenv("MOVIECONV_PICTURES");
+        const QImage picture = app.Window().grab().toImage();
+        std::set<QRgb> colours;
+        for (int x = 0; x < picture.width(); x += 7)
+            for (int y = 0; y < picture.height(); y += 7)
+                colours.insert(picture.pixel(x, y));
+        EXPECT_GT(colours.size(), 8U) << "an empty picture";
+        if (!place.isEmpty()) {
+            EXPECT_TRUE(picture.save(QString::fromLocal8Bit(place) + "/window-" + name + ".png"));
+        }
+    }
+};
+
+std::string Holiday() {
+    return test_movies::Make("window-4s.mkv",
+                             {"-f", "lavfi", "-i",
+                              "mandelbrot=s=1280x720:r=25:start_scale=0.6:end_scale=0.01:end_pts=250,"
+                              "format=yuv420p",
+                              "-f", "lavfi", "-i", "sine=440:r=48000", "-t", "4", "-c:v", "libx264",
+                              "-preset", "veryfast", "-c:a", "aac"});
+}
+
+} // namespace
+
+TEST_F(PicturesTest, ConvertsMoviesWithALivePicture) {
+    const std::string movie = Holiday();
+    std::vector<std::string> movies;
+    for (const char* name : {"Beach.mkv", "Mountains at dawn.mkv", "Grandma’s birthday.mkv", "Harbour.mkv"}) {
+        std::filesystem::copy_file(movie, folder / name);
+        movies.push_back(folder / name);
+    }
+    WriteFile(folder / "Packing list.mkv", "Socks");
+    movies.push_back(folder / "Packing list.mkv");
+    app.Window().resize(1080, 720);
+    app.Begin({});
+    QApplication::processEvents();
+    Photograph("empty");
+    app.TheQueue().Add(movies);
+    AwaitExamined(movies.size());
+    EXPECT_EQ(At(0).facts->width, 1280);
+    EXPECT_FALSE(At(4).unusable.isEmpty());
+    auto* view = app.Window().findChild<QueueView*>();
+    view->Select(At(1).id);
+    const auto* strip = app.Window().findChild<RangeStrip*>();
+    ASSERT_TRUE(Await([&] { return strip->IsFilled(); }));
+    QApplication::processEvents();
+    Photograph("entry");
+
+    view->Select(At(0).id);
+    Act("start");
+    const auto* picture = app.Window().findChild<PictureView*>();
+    ASSERT_TRUE(Await(
+        [&] { return !picture->Picture().isNull() && (At(0).figures.fraction > 0.3 || At(0).IsOver()); }));
+    Photograph("work");
+    ASSERT_TRUE(AwaitDone());
+    for (size_t row = 0; row < 4; ++row) {
+        EXPECT_EQ(At(row).state, State::kDone) << At(row).outcome.sentence.toStdString();
+        EXPECT_GT(std::filesystem::file_size(At(row).target), 10'000U);
+    }
+    view->Select(At(0).id);
+    QApplication::processEvents();
+    Photograph("done");
+    QApplication::setPalette(OwnPalette(true));
+    view->Select(At(4).id);
+    QApplication::processEvents();
+    Photograph("dark");
+    QApplication::setPalette(OwnPalette(false));
+}
+
+TEST_F(PicturesTest, ConvertsSeveralAtOnceAndStopsThem) {
+    const std::string movie = Holiday();
+    app.TheQueue().SetNaming({QStringLiteral("{name}"), folder.Path()});
+    app.TheQueue().Add(std::vector<std::string>(8, movie));
+    app.TheDispatcher().SetAtOnce(8);
+    AwaitExamined(8);
+    app.TheDispatcher().Start();
+    ASSERT_TRUE(Await([&] {
+        return std::all_of(app.TheQueue().Entries().begin(), app.TheQueue().Entries().end(),
+                           [](const Entry& entry) { return entry.figures.position > 0; });
+    }));
+    app.TheDispatcher().PauseAll();
+    EXPECT_TRUE(Await([&] { return At(7).figures.phase == Phase::kPaused; }));
+    app.TheDispatcher().StopAll();
+    ASSERT_TRUE(AwaitDone());
+    std::set<std::string> targets;
+    for (const Entry& entry : app.TheQueue().Entries()) {
+        EXPECT_EQ(entry.state, State::kStopped) << entry.outcome.sentence.toStdString();
+        EXPECT_TRUE(std::filesystem::exists(entry.target)) << entry.target;
+        targets.insert(entry.target);
+    }
+    EXPECT_EQ(targets.size(), 8U);
+}
+
+TEST_F(PicturesTest, TellsWhatGoesWrongInWords) {
+    const std::string movie = Holiday();
+    app.TheQueue().Add({movie});
+    AwaitExamined(1);
+    app.TheQueue().SetTarget(At(0).id, folder / "there is no such folder/x.mp4");
+    AwaitExamined(1);
+    EXPECT_EQ(At(0).findings.warnings.size(), 1);
+    app.TheDispatcher().Start();
+    ASSERT_TRUE(AwaitDone());
+    EXPECT_EQ(At(0).state, State::kFailed);
+    EXPECT_TRUE(At(0).outcome.sentence.endsWith(QLatin1Char('.')));
+    app.TheQueue().Retry({At(0).id});
+    app.TheQueue().SetTarget(At(0).id, movie);
+    AwaitExamined(1);
+    EXPECT_TRUE(At(0).findings.targetExists);
+    app.TheQueue().SetReplace(At(0).id, true);
+    app.TheDispatcher().Start(); // a source is never replaced by what is made of it
+    ASSERT_TRUE(AwaitDone());
+    EXPECT_EQ(At(0).state, State::kFailed);
+    EXPECT_GT(std::filesystem::file_size(movie), 10'000U);
+}

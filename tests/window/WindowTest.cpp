@@ -1,0 +1,516 @@
+// Every action of the window, over a scripted runner.
+#include "host/window/App.h"
+#include "host/window/widgets/EntryPage.h"
+#include "host/window/widgets/NamingDialog.h"
+#include "host/window/widgets/NoticeBar.h"
+#include "host/window/widgets/OverPage.h"
+#include "host/window/widgets/QueueView.h"
+#include "host/window/widgets/RangeStrip.h"
+#include "host/window/widgets/WorkPage.h"
+#include "tests/support/Folder.h"
+#include "tests/window/ScriptedRunner.h"
+
+#include <gtest/gtest.h>
+
+#include <QAccessible>
+#include <QAction>
+#include <QApplication>
+#include <QCheckBox>
+#include <QComboBox>
+#include <QDropEvent>
+#include <QFileDialog>
+#include <QLabel>
+#include <QLineEdit>
+#include <QMimeData>
+#include <QPushButton>
+#include <QSignalSpy>
+#include <QSlider>
+#include <QToolButton>
+
+#include <set>
+
+using namespace movieconv::window;
+
+namespace {
+
+struct WindowTest : testing::Test {
+    Folder folder;
+    ScriptedRunner runner;
+    Settings settings{QString::fromStdString(folder / "settings")};
+    std::unique_ptr<App> app;
+
+    WindowTest() { Begin(); }
+
+    void Begin(const std::vector<std::string>& movies = {}) {
+        app.reset();
+        app = std::make_unique<App>(runner, settings, folder / "queue");
+        app->Begin(movies);
+    }
+
+    MainWindow& Window() { return app->Window(); }
+    const Entry& At(size_t row) { return app->TheQueue().Entries().at(row); }
+    ScriptedRunner::Script& Script(size_t number) { return *runner.scripts.at(number); }
+
+    std::string Movie(const std::string& name) {
+        WriteFile(folder / name, "movie60");
+        return folder / name;
+    }
+
+    void Add(const std::vector<std::string>& names) {
+        std::vector<std::string> paths;
+        for (const std::string& name : names)
+            paths.push_back(Movie(name));
+        const size_t before = app->TheQueue().Entries().size();
+        app->TheQueue().Add(paths);
+        ASSERT_TRUE(Await([&] {
+            const auto& entries = app->TheQueue().Entries();
+            return entries.size() == before + names.size() &&
+                   std::none_of(entries.begin(), entries.end(),
+                                [](auto& entry) { return entry.IsBeingExamined(); });
+        }));
+    }
+
+    template <class T>
+    T* The(const char* name = nullptr) {
+        T* found = Window().findChild<T*>(name == nullptr ? QString() : QLatin1String(name));
+        if (found == nullptr)
+            ADD_FAILURE() << "the window has no "
+                          << (name == nullptr ? T::staticMetaObject.className() : name);
+        return found;
+    }
+    template <class T>
+    T* Named(const QString& accessibleName) {
+        for (T* found : Window().findChildren<T*>())
+            if (found->accessibleName() == accessibleName)
+                return found;
+        ADD_FAILURE() << "the window has no " << accessibleName.toStdString();
+        return nullptr;
+    }
+    QPushButton* Button(const QString& text) {
+        for (QPushButton* button : Window().findChildren<QPushButton*>())
+            if (QString(button->text()).remove(QLatin1Char('&')) == text && button->isVisible())
+                return button;
+        ADD_FAILURE() << "the window shows no button " << text.toStdString();
+        return nullptr;
+    }
+    void Act(const char* name) {
+        QAction* action = The<QAction>(name);
+        EXPECT_TRUE(action->isEnabled()) << name;
+        action->trigger();
+    }
+    void Click(const QString& text) {
+        if (QPushButton* button = Button(text))
+            QTest::mouseClick(button, Qt::LeftButton);
+    }
+    void Select(size_t row) { The<QueueView>()->Select(At(row).id); }
+    bool AwaitScripts(size_t count) {
+        return Await([&] { return runner.scripts.size() == count; });
+    }
+    bool Tells(const QString& words) {
+        for (const QLabel* label : The<NoticeBar>()->findChildren<QLabel*>())
+            if (label->text().contains(words))
+                return true;
+        return false;
+    }
+    template <class Page>
+    bool Shows() {
+        return The<Page>()->isVisible();
+    }
+
+    void Drop(const QByteArray& uris) {
+        QMimeData data;
+        data.setData(QStringLiteral("text/uri-list"), uris);
+        QDragEnterEvent enter({300, 300}, Qt::CopyAction, &data, Qt::LeftButton, Qt::NoModifier);
+        QApplication::sendEvent(&Window(), &enter);
+        ASSERT_TRUE(enter.isAccepted());
+        QDropEvent drop({300, 300}, Qt::CopyAction, &data, Qt::LeftButton, Qt::NoModifier);
+        QApplication::sendEvent(&Window(), &drop);
+    }
+};
+
+} // namespace
+
+TEST_F(WindowTest, ExplainsItselfWhenItIsEmptyAndOpensFiles) {
+    EXPECT_TRUE(The<QPushButton>("openButton")->isVisible());
+    EXPECT_FALSE(The<QPushButton>("startButton")->isVisible());
+    Movie("a.mkv");
+    QTest::mouseClick(The<QPushButton>("openButton"), Qt::LeftButton);
+    auto* dialog = The<QFileDialog>("openFiles");
+    EXPECT_FALSE(dialog->isModal());
+    Q_EMIT dialog->filesSelected({QString::fromStdString(folder / "a.mkv")});
+    dialog->close();
+    Act("openFolder");
+    dialog = The<QFileDialog>("openFolder");
+    std::filesystem::create_directory(folder / "more");
+    Movie("more/b.mkv");
+    Q_EMIT dialog->filesSelected({QString::fromStdString(folder / "more")});
+    dialog->close();
+    ASSERT_TRUE(Await([&] { return app->TheQueue().Entries().size() == 2; }));
+    EXPECT_TRUE(Await([&] { return The<QPushButton>("startButton")->isEnabled(); }));
+    EXPECT_TRUE(Shows<EntryPage>());
+}
+
+TEST_F(WindowTest, TakesWhatIsDropped) {
+    Movie("ü %.mkv");
+    WriteFile(folder / "words.txt", "words");
+    Drop("file://" + QByteArray::fromStdString(folder.Path()) + "/%C3%BC%20%25.mkv\r\nfile://" +
+         QByteArray::fromStdString(folder / "words.txt") + "\r\nhttps://example.org/movie\r\n");
+    ASSERT_TRUE(Await([&] { return app->TheQueue().Entries().size() == 2 && !At(1).unusable.isEmpty(); }));
+    EXPECT_EQ(At(0).source, folder / "ü %.mkv");
+    EXPECT_TRUE(Tells("example.org"));
+    Select(1);
+    EXPECT_TRUE(Named<QLabel>("Why it cannot be converted")->isVisible());
+    Act("remove");
+    EXPECT_EQ(app->TheQueue().Entries().size(), 1U);
+}
+
+TEST_F(WindowTest, EditsAnEntry) {
+    Add({"a.mkv", "b.mkv"});
+    Select(1);
+    auto* preset = Named<QComboBox>("Preset");
+    QTest::keyClick(preset, Qt::Key_Down);
+    EXPECT_EQ(At(1).wishes.preset, "web");
+    auto* format = Named<QComboBox>("File format");
+    EXPECT_TRUE(format->currentText().contains(QStringLiteral("webm")));
+    QTest::keyClick(format, Qt::Key_Down);
+    QTest::keyClick(Named<QComboBox>("Picture size"), Qt::Key_Down);
+    QTest::keyClick(Named<QSlider>("Quality"), Qt::Key_Home);
+    EXPECT_EQ(At(1).wishes.format, "mp4");
+    EXPECT_EQ(At(1).wishes.height, 2160);
+    EXPECT_EQ(At(1).wishes.quality, 0);
+    auto* begin = Named<QLineEdit>("Begin of the range");
+    begin->selectAll();
+    QTest::keyClicks(begin, "0:10");
+    QTest::keyClick(begin, Qt::Key_Return);
+    auto* end = Named<QLineEdit>("End of the range");
+    end->selectAll();
+    QTest::keyClicks(end, "50\r");
+    EXPECT_EQ(At(1).wishes.begin, 10);
+    EXPECT_EQ(At(1).wishes.end, 50);
+    end->selectAll();
+    QTest::keyClicks(end, "rubbish\r");
+    EXPECT_FALSE(At(1).wishes.end);
+    EXPECT_EQ(end->text(), "1:00");
+    EXPECT_EQ(At(0).wishes, Wishes());
+
+    Click("Use for all that wait");
+    EXPECT_EQ(At(0).wishes.preset, "web");
+    EXPECT_EQ(At(0).wishes.begin, 0);
+    Add({"c.mkv"});
+    EXPECT_EQ(At(2).wishes.preset, "web"); // the last choice is the next one's
+    EXPECT_EQ(Settings(QString::fromStdString(folder / "settings")).LoadWishes().format, "mp4");
+}
+
+TEST_F(WindowTest, ChoosesTracksAndTarget) {
+    Add({"a.mkv"});
+    for (QCheckBox* check : Window().findChildren<QCheckBox*>())
+        if (check->text().contains(QStringLiteral("Kommentar")) ||
+            check->text().contains(QStringLiteral("French")))
+            QTest::keyClick(check, Qt::Key_Space);
+    EXPECT_EQ(At(0).wishes.sounds, QList<int>{1});
+    EXPECT_EQ(At(0).wishes.subtitles, QList<int>{});
+    WriteFile(folder / "there.mp4", "something");
+    auto* target = Named<QLineEdit>("File to save as");
+    target->selectAll();
+    QTest::keyClicks(target, QString::fromStdString(folder / "there.mp4") + "\r");
+    ASSERT_TRUE(Await([&] { return At(0).findings.targetExists; }));
+    EXPECT_TRUE(Named<QLabel>("Warnings")->isVisible());
+    for (QCheckBox* check : Window().findChildren<QCheckBox*>())
+        if (check->text().contains(QStringLiteral("Replace")))
+            QTest::keyClick(check, Qt::Key_Space);
+    EXPECT_TRUE(At(0).replace);
+}
+
+TEST_F(WindowTest, ChoosesARangeOnTheStrip) {
+    Add({"a.mkv"});
+    auto* strip = The<RangeStrip>();
+    ASSERT_TRUE(Await([&] { return strip->isEnabled(); }));
+    QTest::mousePress(strip, Qt::LeftButton, {}, QPoint(strip->width() / 4, 20));
+    QTest::mouseRelease(strip, Qt::LeftButton);
+    EXPECT_NEAR(At(0).wishes.begin, 15, 1);
+    const double begin = At(0).wishes.begin;
+    QTest::keyClick(strip, Qt::Key_Right);
+    EXPECT_NEAR(At(0).wishes.begin, begin + 1, 1e-6);
+    QTest::keyClick(strip, Qt::Key_E);
+    QTest::keyClick(strip, Qt::Key_Left);
+    EXPECT_NEAR(*At(0).wishes.end, 59, 1e-6);
+    QTest::keyClick(strip, Qt::Key_PageUp);
+    EXPECT_GT(*At(0).wishes.end, At(0).wishes.begin); // never before the begin
+    QTest::keyClick(strip, Qt::Key_End);
+    EXPECT_FALSE(At(0).wishes.end);
+    QTest::keyClick(strip, Qt::Key_B);
+    QTest::keyClick(strip, Qt::Key_Home);
+    EXPECT_EQ(At(0).wishes.begin, 0);
+}
+
+TEST_F(WindowTest, SavesAndLoadsPresets) {
+    Add({"a.mkv"});
+    const QString path = QString::fromStdString(folder / "own.json");
+    Click("Save as preset…");
+    Q_EMIT The<QFileDialog>("savePreset")->fileSelected(path);
+    The<QFileDialog>("savePreset")->close();
+    EXPECT_EQ(runner.saved.at(folder / "own.json"), At(0).wishes);
+    Click("Load preset…");
+    Q_EMIT The<QFileDialog>("loadPreset")->fileSelected(path);
+    EXPECT_EQ(At(0).wishes.preset, "web");
+    Q_EMIT The<QFileDialog>("loadPreset")->fileSelected(path + "x");
+    EXPECT_TRUE(Tells("This is no preset."));
+}
+
+TEST_F(WindowTest, ConvertsWithALivePicture) {
+    Add({"a.mkv", "b.mkv"});
+    Click("Convert");
+    ASSERT_TRUE(AwaitScripts(1));
+    EXPECT_TRUE(Shows<WorkPage>());
+    EXPECT_TRUE(Script(0).shown);
+    Script(0).Figure(30, 60);
+    Script(0).listener->OnPicture(runner.PictureAt({}, 0, 64));
+    ASSERT_TRUE(Await([&] { return !The<PictureView>()->Picture().isNull(); }));
+    EXPECT_EQ(Named<QLabel>("Progress in percent")->text(), "50.0 %");
+    EXPECT_TRUE(Window().windowTitle().startsWith(QStringLiteral("25 %")));
+    Script(0).End(Ending::kDone);
+    ASSERT_TRUE(AwaitScripts(2)); // the window goes on to the next movie
+    EXPECT_TRUE(Await([&] { return Script(1).shown; }));
+    EXPECT_TRUE(The<PictureView>()->Picture().isNull());
+    Window().showMinimized();
+    EXPECT_TRUE(Await([&] { return !Script(1).shown; }));
+    Window().showNormal();
+    EXPECT_TRUE(Await([&] { return Script(1).shown; }));
+    Script(1).End(Ending::kDone);
+    ASSERT_TRUE(Await([&] { return !app->TheDispatcher().IsWorking(); }));
+    EXPECT_TRUE(Shows<OverPage>());
+    EXPECT_FALSE(The<QPushButton>("startButton")->isEnabled());
+}
+
+TEST_F(WindowTest, OpensWhatWasConverted) {
+    Add({"a.mkv"});
+    QSignalSpy files(&Window(), &MainWindow::FileWanted);
+    QSignalSpy folders(&Window(), &MainWindow::FolderWanted);
+    QObject::disconnect(&Window(), &MainWindow::FileWanted, nullptr, nullptr);
+    files.clear();
+    Act("start");
+    ASSERT_TRUE(AwaitScripts(1));
+    Outcome outcome;
+    outcome.ending = Ending::kDone;
+    outcome.files = {folder / "a.mp4"};
+    outcome.notCarried = QStringList{"cover: WebM cannot hold it"};
+    Script(0).listener->OnEnd(outcome);
+    ASSERT_TRUE(Await([&] { return Shows<OverPage>(); }));
+    EXPECT_TRUE(Named<QLabel>("What was not carried over")->text().contains(QStringLiteral("cover")));
+    EXPECT_EQ(The<QueueView>()->SelectedIds().size(), 1);
+    Act("again");
+    EXPECT_EQ(At(0).state, State::kWaiting);
+    EXPECT_TRUE(At(0).outcome.files.empty());
+}
+
+TEST_F(WindowTest, RunsEightMoviesPausesStopsAndTellsTheDiskIsFull) {
+    Add({"1", "2", "3", "4", "5", "6", "7", "8", "9"});
+    Act("atOnce8");
+    EXPECT_EQ(settings.LoadAtOnce(), 8);
+    Act("start");
+    ASSERT_TRUE(AwaitScripts(8));
+    Act("pause");
+    EXPECT_TRUE(
+        std::all_of(runner.scripts.begin(), runner.scripts.end(), [](auto& one) { return one->paused; }));
+    Click("Resume");
+    EXPECT_FALSE(Script(7).paused);
+    Script(3).Phase(Phase::kWaitingForRoom);
+    ASSERT_TRUE(Await([&] { return Tells("is full"); }));
+    Script(3).Figure(1, 60);
+    ASSERT_TRUE(Await([&] { return !Tells("is full"); }));
+    Act("stopAfter");
+    EXPECT_TRUE(app->TheDispatcher().StopsAfterThis());
+    Select(2);
+    auto* page = The<WorkPage>();
+    QTest::mouseClick(page->findChild<QPushButton*>(QStringLiteral("pauseThis")), Qt::LeftButton);
+    EXPECT_TRUE(Script(2).paused);
+    EXPECT_FALSE(Script(1).paused);
+    QTest::mouseClick(page->findChild<QPushButton*>(QStringLiteral("stopThis")), Qt::LeftButton);
+    ASSERT_TRUE(Await([&] { return At(2).state == State::kStopped; }));
+    EXPECT_EQ(At(8).state, State::kWaiting);
+    QTest::mouseClick(The<QPushButton>("stopButton"), Qt::LeftButton);
+    ASSERT_TRUE(Await([&] { return !app->TheDispatcher().IsWorking(); }));
+    Act("removeOver");
+    EXPECT_EQ(app->TheQueue().Entries().size(), 1U);
+}
+
+TEST_F(WindowTest, ShowsFailuresWithTheirLog) {
+    Add({"a.mkv"});
+    Act("start");
+    ASSERT_TRUE(AwaitScripts(1));
+    Script(0).listener->OnNote("A stamp was put right.");
+    Script(0).End(Ending::kFailed, "It broke. Do this.");
+    ASSERT_TRUE(Await([&] { return Shows<OverPage>(); }));
+    EXPECT_EQ(Named<QLabel>("What became of the movie")->text(), "It broke. Do this.");
+    const auto* log = The<OverPage>()->findChild<QWidget*>(QStringLiteral("log"));
+    ASSERT_NE(log, nullptr);
+    EXPECT_TRUE(log->isVisible());
+    Click("Convert again");
+    EXPECT_EQ(At(0).state, State::kWaiting);
+    EXPECT_TRUE(Shows<EntryPage>());
+}
+
+TEST_F(WindowTest, AsksOnceBeforeItClosesWhileWorking) {
+    QSignalSpy closed(&Window(), &MainWindow::Closed);
+    Add({"a.mkv", "b.mkv"});
+    Act("start");
+    ASSERT_TRUE(AwaitScripts(1));
+    Act("quit");
+    EXPECT_TRUE(Tells("Movies are being converted."));
+    Click("Go on");
+    EXPECT_FALSE(Script(0).stopped);
+    Act("quit");
+    Click("Stop and close");
+    EXPECT_TRUE(Script(0).stopped);
+    ASSERT_TRUE(Await([&] { return !closed.isEmpty(); }));
+    EXPECT_EQ(runner.scripts.size(), 1U);
+    EXPECT_FALSE(Window().isVisible());
+    Begin(); // the rest is there the next time
+    EXPECT_EQ(At(0).state, State::kStopped);
+    EXPECT_EQ(At(1).state, State::kWaiting);
+}
+
+TEST_F(WindowTest, OffersWhatWasInterruptedOnceMore) {
+    Add({"a.mkv", "b.mkv"});
+    Act("start");
+    ASSERT_TRUE(AwaitScripts(1));
+    // What a killed program leaves: the journal as it is now.
+    ASSERT_TRUE(Await([&] { return ReadFile(folder / "queue").find("active") != std::string::npos; }));
+    const std::string journal = ReadFile(folder / "queue");
+    app.reset();
+    WriteFile(folder / "queue", journal);
+    runner.scripts.clear();
+    Begin();
+    EXPECT_EQ(At(0).state, State::kInterrupted);
+    EXPECT_TRUE(Shows<OverPage>());
+    QTest::mouseClick(The<NoticeBar>()->findChild<QPushButton*>(), Qt::LeftButton);
+    ASSERT_TRUE(AwaitScripts(1));
+    EXPECT_EQ(Script(0).order.source, folder / "a.mkv");
+}
+
+TEST_F(WindowTest, MovesByKeysAndByDragging) {
+    Add({"a", "b", "c"});
+    auto* view = The<QueueView>();
+    Select(0);
+    Act("down");
+    EXPECT_EQ(NameOf(At(1).source), "a");
+    Act("up");
+    Act("up");
+    EXPECT_EQ(NameOf(At(0).source), "a");
+    view->selectAll();
+    Act("remove");
+    EXPECT_TRUE(app->TheQueue().Entries().empty());
+    EXPECT_TRUE(The<QPushButton>("openButton")->isVisible());
+}
+
+TEST_F(WindowTest, NamesNewFiles) {
+    Add({"a.mkv"});
+    Act("naming");
+    auto* dialog = The<NamingDialog>();
+    auto* pattern = Named<QLineEdit>("Pattern of the names");
+    pattern->setText(QStringLiteral("{name} small"));
+    Named<QLineEdit>("Folder for new files")->clear();
+    QTest::keyClicks(Named<QLineEdit>("Folder for new files"), "/elsewhere");
+    QTest::keyClick(dialog, Qt::Key_Return);
+    EXPECT_EQ(At(0).target, "/elsewhere/a small.mp4");
+    EXPECT_EQ(settings.LoadNaming().folder, "/elsewhere");
+}
+
+TEST_F(WindowTest, RemembersWhatHappensAtTheEnd) {
+    Act("endSound");
+    Act("end1");
+    EXPECT_TRUE(settings.LoadAtEnd().sound);
+    EXPECT_EQ(settings.LoadAtEnd().then, AtEnd::Then::kQuit);
+    QSignalSpy closed(&Window(), &MainWindow::Closed);
+    Add({"a.mkv"});
+    Act("start");
+    ASSERT_TRUE(AwaitScripts(1));
+    Script(0).End(Ending::kDone);
+    EXPECT_TRUE(Await([&] { return !closed.isEmpty(); }));
+}
+
+TEST_F(WindowTest, StaysWhollyUsableWithFiveHundredEntries) {
+    std::vector<std::string> names;
+    for (int i = 0; i < 500; ++i)
+        names.push_back("movie " + std::to_string(i));
+    Add(names);
+    Select(499);
+    EXPECT_TRUE(Shows<EntryPage>());
+    Act("start");
+    ASSERT_TRUE(AwaitScripts(1));
+    EXPECT_EQ(app->TheDispatcher().Now().waiting, 499);
+}
+
+namespace {
+
+/// Visits all that a screen reader can reach, below `node`.
+void Visit(QAccessibleInterface* node, std::set<QAccessibleInterface*>& seen, QStringList& nameless) {
+    if (node == nullptr || !node->isValid() || !seen.insert(node).second)
+        return;
+    const std::set<QAccessible::Role> needNames = {
+        QAccessible::PushButton,   QAccessible::CheckBox, QAccessible::RadioButton, QAccessible::ComboBox,
+        QAccessible::EditableText, QAccessible::Slider,   QAccessible::ProgressBar, QAccessible::List,
+        QAccessible::ListItem,     QAccessible::MenuItem, QAccessible::Graphic};
+    const bool partOfAnother = node->parent() != nullptr && node->parent()->role() == QAccessible::ComboBox;
+    if (needNames.contains(node->role()) && !partOfAnother && node->text(QAccessible::Name).isEmpty() &&
+        !node->state().invisible) {
+        const QObject* object = node->object();
+        nameless += QStringLiteral("%1 %2").arg(object ? object->metaObject()->className() : "?",
+                                                object ? object->objectName() : QString());
+    }
+    for (int i = 0; i < node->childCount(); ++i)
+        Visit(node->child(i), seen, nameless);
+}
+
+} // namespace
+
+TEST_F(WindowTest, NamesEveryControlForScreenReaders) {
+    Add({"a.mkv", "b.mkv", "c.mkv"});
+    const auto visit = [&] {
+        std::set<QAccessibleInterface*> seen;
+        QStringList nameless;
+        Visit(QAccessible::queryAccessibleInterface(&Window()), seen, nameless);
+        EXPECT_TRUE(nameless.isEmpty()) << nameless.join("\n").toStdString();
+        return seen.size();
+    };
+    EXPECT_GT(visit(), 50U);
+    for (QToolButton* button : The<EntryPage>()->findChildren<QToolButton*>())
+        if (button->isCheckable())
+            button->click();
+    visit();
+    Act("start");
+    ASSERT_TRUE(AwaitScripts(1));
+    visit();
+    Script(0).End(Ending::kFailed, "It broke.");
+    ASSERT_TRUE(AwaitScripts(2));
+    Act("quit");
+    Select(0);
+    visit();
+    Act("naming");
+    std::set<QAccessibleInterface*> seen;
+    QStringList nameless;
+    Visit(QAccessible::queryAccessibleInterface(The<NamingDialog>()), seen, nameless);
+    EXPECT_TRUE(nameless.isEmpty()) << nameless.join("\n").toStdString();
+}
+
+TEST_F(WindowTest, ReachesEveryControlByTab) {
+    Add({"a.mkv"});
+    Window().activateWindow();
+    ASSERT_TRUE(QTest::qWaitForWindowActive(&Window()));
+    std::set<QWidget*> reached;
+    The<QueueView>()->setFocus();
+    for (int i = 0; i < 60; ++i) {
+        QTest::keyClick(QApplication::focusWidget(), Qt::Key_Tab);
+        reached.insert(QApplication::focusWidget());
+    }
+    for (QWidget* widget : Window().findChildren<QWidget*>()) {
+        const bool control = qobject_cast<QAbstractButton*>(widget) || qobject_cast<QComboBox*>(widget) ||
+                             qobject_cast<QLineEdit*>(widget) || qobject_cast<QSlider*>(widget);
+        const bool inner = widget->parentWidget() && qobject_cast<QLineEdit*>(widget->parentWidget());
+        if (control && !inner && widget->isVisibleTo(&Window()) && widget->isEnabled() &&
+            widget->focusPolicy() != Qt::NoFocus) {
+            EXPECT_TRUE(reached.contains(widget))
+                << widget->metaObject()->className() << " " << widget->accessibleName().toStdString();
+        }
+    }
+}
