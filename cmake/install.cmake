@@ -1,4 +1,4 @@
-# Install rules, the CMake and pkg-config packages, and the Debian package.
+# Install rules, and the CMake and pkg-config packages. The Debian packages are made of what is installed: debian/.
 #
 # The engine, its companions and the program lie in one folder of their own, <libdir>/movieconv, where they find each
 # other by $ORIGIN; <bindir> and <libdir> hold links to the program and to the engine. The links lead to the real files
@@ -79,23 +79,4 @@ foreach(name IN ITEMS movieconv movieconv-companions)
   install(FILES ${CMAKE_BINARY_DIR}/${name}.pc DESTINATION ${pkgconfig_dir})
 endforeach()
 
-# cpack
-set(CPACK_GENERATOR DEB)
-set(CPACK_PACKAGE_NAME movieconv)
-set(CPACK_PACKAGE_VENDOR "MovieConv")
-set(CPACK_PACKAGE_CONTACT "MovieConv maintainers <movieconv@localhost>")
-set(CPACK_PACKAGE_DESCRIPTION_SUMMARY "movie converter: engine, media writer and program")
-set(CPACK_PACKAGE_DESCRIPTION
-  "A movie-conversion engine as a shared library with its media writer over the FFmpeg libraries, bit-exact colour
-conversion routines, the headers to build against them, and the command-line program movieconv.")
-set(CPACK_STRIP_FILES ON)
-set(CPACK_DEBIAN_FILE_NAME DEB-DEFAULT)
-set(CPACK_DEBIAN_PACKAGE_SECTION video)
-set(CPACK_DEBIAN_PACKAGE_SHLIBDEPS ON)
-if(FILTERS_FOUND) # loaded when a picture needs it, so nothing is linked with it
-  string(REGEX MATCH "^[0-9]+" filters_major "${FILTERS_VERSION}")
-  set(CPACK_DEBIAN_PACKAGE_DEPENDS "libavfilter${filters_major}")
-endif()
-set(CPACK_DEBIAN_PACKAGE_SHLIBDEPS_PRIVATE_DIRS ${CMAKE_LIBRARY_OUTPUT_DIRECTORY})
 include(cmake/window.cmake)
-include(CPack)

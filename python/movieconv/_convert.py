@@ -29,9 +29,10 @@ class FileProgress:
 
 def _program() -> str:
     """The program: that which MOVIECONV_PROGRAM names, else one beside the library, else one in the PATH."""
-    beside = os.path.join(os.path.dirname(os.path.realpath(library()._name)), "movieconv")
+    name = library()._name
+    beside = os.path.join(os.path.dirname(os.path.realpath(name)), "movieconv") if os.sep in name else None
     for candidate in (os.environ.get("MOVIECONV_PROGRAM"), beside, shutil.which("movieconv")):
-        if candidate and os.access(candidate, os.X_OK):
+        if candidate and os.path.isfile(candidate) and os.access(candidate, os.X_OK):
             return candidate
     raise FileNotFoundError("The program movieconv is not installed; MOVIECONV_PROGRAM can name it.")
 
