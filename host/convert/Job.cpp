@@ -30,14 +30,22 @@ public:
     Impl(Request request, Observer& observer, Loop loop)
         : request_(std::move(request)), outlet_(observer, std::move(loop)), wishes_(request_.preview) {}
     ~Impl() {
-        wishes_.stop = true;
-        wishes_.bell.Ring();
+        Stop();
         if (thread_.joinable())
             thread_.join();
     }
 
     void Start() {
         thread_ = std::thread([this] { Run(); });
+    }
+
+    /// The source is interrupted only while it is opened: afterwards it is the course that stops it.
+    void Stop() {
+        wishes_.stop = true;
+        wishes_.bell.Ring();
+        const std::lock_guard lock(mutex_);
+        if (opening_)
+            opening_->Interrupt();
     }
 
     Wishes& WhatIsWanted() { return wishes_; }
@@ -55,11 +63,13 @@ public:
 private:
     void Run() noexcept;
     Verdict Convert();
+    std::unique_ptr<Movie> Open();
 
     const Request request_;
     Outlet outlet_;
     Wishes wishes_;
     mutable std::mutex mutex_;
+    std::shared_ptr<Interruption> opening_; // null unless the source is being opened
     std::condition_variable end_;
     bool ended_ = false;
     Verdict verdict_;
@@ -92,8 +102,34 @@ void Job::Impl::Run() noexcept {
 Verdict Job::Impl::Convert() {
     ChooseFormat(request_);
     CheckOutput(request_);
-    Movie movie = OpenMovie(request_);
-    return Course(request_, movie, wishes_, outlet_).Run();
+    const std::unique_ptr<Movie> movie = Open();
+    if (movie)
+        return Course(request_, *movie, wishes_, outlet_).Run();
+    Verdict stopped;
+    stopped.outcome = Outcome::kStopped;
+    return stopped;
+}
+
+/// Null when it is stopped before the source is open.
+std::unique_ptr<Movie> Job::Impl::Open() {
+    const auto interruption = std::make_shared<Interruption>();
+    const auto setOpening = [this](std::shared_ptr<Interruption> opening) {
+        const std::lock_guard lock(mutex_);
+        opening_ = std::move(opening);
+    };
+    setOpening(interruption);
+    std::unique_ptr<Movie> movie;
+    try {
+        if (!wishes_.stop)
+            movie.reset(new Movie(OpenMovie(request_, interruption)));
+    } catch (const Failure&) {
+        setOpening(nullptr);
+        if (!interruption->Interrupted())
+            throw;
+        return nullptr;
+    }
+    setOpening(nullptr);
+    return interruption->Interrupted() ? nullptr : std::move(movie);
 }
 
 Job::Job(Request request, Observer& observer, Loop loop)
@@ -116,8 +152,7 @@ void Job::Resume() {
 }
 
 void Job::Stop() {
-    impl_->WhatIsWanted().stop = true;
-    impl_->WhatIsWanted().bell.Ring();
+    impl_->Stop();
 }
 
 void Job::RetryWrite() {

@@ -2,6 +2,8 @@
 
 #include "host/convert/Failure.h"
 
+#include <utility>
+
 namespace movieconv {
 namespace {
 
@@ -26,8 +28,8 @@ auto Opened(Open open) {
 
 } // namespace
 
-Movie OpenMovie(const Request& request) {
-    return Opened([&] { return Movie(request.input, ChoiceOf(request)); });
+Movie OpenMovie(const Request& request, std::shared_ptr<Interruption> interruption) {
+    return Opened([&] { return Movie(request.input, ChoiceOf(request), std::move(interruption)); });
 }
 
 SourceInfo LookAtSource(const Request& request) {

@@ -33,8 +33,9 @@ bool LiesBelow(const fs::path& path, const fs::path& folder) {
 
 } // namespace
 
-CompanionFiles::CompanionFiles(std::string path, bool allowed)
-    : source_(std::move(path)), allowed_(allowed) {}
+CompanionFiles::CompanionFiles(std::string path, bool allowed,
+                               std::shared_ptr<const Interruption> interruption)
+    : source_(std::move(path)), allowed_(allowed), interruption_(std::move(interruption)) {}
 
 void CompanionFiles::Guard(AVFormatContext& context) {
     context.opaque = this;
@@ -65,6 +66,10 @@ std::string CompanionFiles::Permit(const std::string& url) const {
     return real.string();
 }
 
+std::unique_ptr<InputFile> CompanionFiles::Open(const std::string& path) const {
+    return std::make_unique<InputFile>(path, interruption_);
+}
+
 int CompanionFiles::OnOpen(AVFormatContext* context, AVIOContext** io, const char* url, int flags,
                            AVDictionary** /*options*/) {
     auto& self = *static_cast<CompanionFiles*>(context->opaque);
@@ -74,7 +79,7 @@ int CompanionFiles::OnOpen(AVFormatContext* context, AVIOContext** io, const cha
         const std::string path = self.Permit(url);
         if (!self.repetition_ && ++self.openings_[path] > kMostOpenings)
             throw SourceError(fmt::format("it names \"{}\" over and over", url));
-        auto file = std::make_unique<InputFile>(path);
+        auto file = self.Open(path);
         *io = file->Io();
         self.open_[*io] = std::move(file);
         return 0;

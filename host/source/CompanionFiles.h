@@ -16,7 +16,7 @@ class CompanionFiles {
 public:
     /// For the source at `path`. Unless `allowed`, no file but the source itself is opened; otherwise also
     /// regular files in its folder and below, as they lie once all symbolic links are followed.
-    CompanionFiles(std::string path, bool allowed);
+    CompanionFiles(std::string path, bool allowed, std::shared_ptr<const Interruption> interruption);
     CompanionFiles(const CompanionFiles&) = delete;
     CompanionFiles& operator=(const CompanionFiles&) = delete;
 
@@ -26,6 +26,9 @@ public:
     /// Where the file called `url` lies, all links followed. Throws SourceError with the reason when it must
     /// not be read.
     std::string Permit(const std::string& url) const;
+
+    /// A file that Permit gave. Throws std::system_error.
+    std::unique_ptr<InputFile> Open(const std::string& path) const;
 
     /// From now on a file may be opened as often as its parts are needed: the source has been opened. Until
     /// then that is a playlist that names itself, in which the demultiplexer would never come to an end.
@@ -41,6 +44,7 @@ private:
 
     const std::string source_;
     const bool allowed_;
+    const std::shared_ptr<const Interruption> interruption_;
     bool repetition_ = false;
     std::map<std::string, int> openings_; // of each file
     std::string refusal_;

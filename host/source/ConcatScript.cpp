@@ -48,9 +48,9 @@ void CheckName(const std::string& name, const std::string& folder, const Compani
     if (name.empty() || name.find_first_of(":?#%\\") != std::string::npos)
         throw SourceError(fmt::format("it names \"{}\", which is not a plain name", name));
     const std::string path = companions.Permit(name[0] == '/' ? name : folder + name);
-    InputFile file(path);
+    const std::unique_ptr<InputFile> file = companions.Open(path);
     const AVInputFormat* format = nullptr;
-    const int result = av_probe_input_buffer2(file.Io(), &format, path.c_str(), nullptr, 0, 0);
+    const int result = av_probe_input_buffer2(file->Io(), &format, path.c_str(), nullptr, 0, 0);
     av::CheckMemory(result);
     if (result < 0 || av_match_list(format->name, formats, ',') == 0)
         throw SourceError(fmt::format("it names \"{}\", which is not a movie", name));

@@ -6,10 +6,10 @@
 #include <fcntl.h>
 #include <new>
 #include <poll.h>
-#include <sys/eventfd.h>
 #include <sys/stat.h>
 #include <system_error>
 #include <unistd.h>
+#include <utility>
 
 namespace movieconv {
 namespace {
@@ -18,8 +18,8 @@ constexpr int kBufferBytes = 64 * 1024;
 
 } // namespace
 
-InputFile::InputFile(const std::string& path)
-    : file_(open(path.c_str(), O_RDONLY | O_CLOEXEC)), wake_(eventfd(0, EFD_CLOEXEC)) {
+InputFile::InputFile(const std::string& path, std::shared_ptr<const Interruption> interruption)
+    : file_(open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK)), interruption_(std::move(interruption)) {
     struct stat status {};
     const bool regular = fstat(file_.Number(), &status) == 0 && S_ISREG(status.st_mode);
     size_ = regular ? status.st_size : 0;
@@ -41,21 +41,17 @@ InputFile::Descriptor::~Descriptor() {
     close(number_);
 }
 
-void InputFile::Interrupt() {
-    interrupted_ = true;
-    eventfd_write(wake_.Number(), 1); // never read again: it ends every later wait too
-}
-
 int InputFile::Read(uint8_t* data, int size) const {
     for (;;) {
-        std::array<pollfd, 2> sources{pollfd{file_.Number(), POLLIN, 0}, pollfd{wake_.Number(), POLLIN, 0}};
+        std::array<pollfd, 2> sources{pollfd{file_.Number(), POLLIN, 0},
+                                      pollfd{interruption_->Descriptor(), POLLIN, 0}};
         const bool waited = poll(sources.data(), sources.size(), -1) >= 0;
-        if (interrupted_)
+        if (interruption_->Interrupted())
             return AVERROR_EXIT;
         const ssize_t count = waited ? read(file_.Number(), data, static_cast<std::size_t>(size)) : -1;
         if (count >= 0)
             return count == 0 ? AVERROR_EOF : static_cast<int>(count);
-        if (errno != EINTR)
+        if (errno != EINTR && errno != EAGAIN)
             return AVERROR(errno);
     }
 }

@@ -3,20 +3,21 @@
 #define MOVIECONV_HOST_SOURCE_INPUTFILE_H
 
 #include "ffmpeg/AvHandles.h"
+#include "host/source/Interruption.h"
 
-#include <atomic>
 #include <cstddef>
 #include <cstdint>
+#include <memory>
 #include <string>
 
 namespace movieconv {
 
-/// One thread reads through Io(); Interrupt may be called from any.
+/// One thread reads through Io().
 class InputFile {
 public:
-    /// Opens `path`, bytes as the system has them: it is never taken for a protocol. Throws
-    /// std::system_error with the reason.
-    explicit InputFile(const std::string& path);
+    /// Opens `path`, bytes as the system has them: it is never taken for a protocol. A pipe that nobody
+    /// writes into yet is waited for by the first read. Throws std::system_error with the reason.
+    InputFile(const std::string& path, std::shared_ptr<const Interruption> interruption);
     InputFile(const InputFile&) = delete;
     InputFile& operator=(const InputFile&) = delete;
 
@@ -30,9 +31,7 @@ public:
     /// bytes, fewer than asked for at the file's end; negative when reading fails.
     int ReadAt(int64_t offset, uint8_t* data, std::size_t size) const;
 
-    /// Makes every read fail from now on, also one that is under way.
-    void Interrupt();
-    bool Interrupted() const { return interrupted_; }
+    const Interruption& Interrupter() const { return *interruption_; }
 
 private:
     class Descriptor {
@@ -52,9 +51,8 @@ private:
     int64_t Seek(int64_t offset, int whence) const;
 
     const Descriptor file_;
-    const Descriptor wake_; // readable once interrupted
+    const std::shared_ptr<const Interruption> interruption_;
     int64_t size_ = 0;
-    std::atomic<bool> interrupted_{false};
     av::Io io_;
 };
 

@@ -9,6 +9,9 @@
 
 namespace movieconv {
 
+/// Seconds that a stream is told to last at least: the engine takes a shorter one for absent.
+constexpr double kShortestTold = 0.001;
+
 inline int64_t ToMediaTime(double seconds) {
     return std::llround(seconds * kTicksPerSecond);
 }

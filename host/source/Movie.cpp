@@ -3,11 +3,14 @@
 #include "host/source/MediaTime.h"
 
 #include <fmt/format.h>
+#include <utility>
 
 namespace movieconv {
 
-Movie::Movie(const std::string& path, const SourceChoice& choice)
-    : source_(path, choice), failures_([this] { demuxer_.Stop(); }), demuxer_(source_, failures_) {
+Movie::Movie(const std::string& path, const SourceChoice& choice, std::shared_ptr<Interruption> interruption)
+    : source_(path, choice, std::move(interruption)),
+      failures_([this] { demuxer_.Stop(); }),
+      demuxer_(source_, failures_) {
     if (source_.PictureStream() != nullptr)
         pictures_ = std::make_unique<PictureDecoder>(source_, demuxer_, failures_, choice.deinterlace);
     if (source_.SoundStream() != nullptr)

@@ -17,8 +17,9 @@ namespace movieconv {
 
 class Movie {
 public:
-    /// Opens the movie and its decoders. Throws SourceError.
-    Movie(const std::string& path, const SourceChoice& choice);
+    /// Opens the movie and its decoders. `interruption` ends this, too. Throws SourceError.
+    Movie(const std::string& path, const SourceChoice& choice,
+          std::shared_ptr<Interruption> interruption = std::make_shared<Interruption>());
 
     const SourceInfo& Info() const { return source_.Info(); }
 

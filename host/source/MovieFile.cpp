@@ -25,8 +25,8 @@ bool IsOneOf(const AVInputFormat& format, const char* names) {
     return av_match_name(format.name, names) != 0 || av_match_list(format.name, names, ',') > 0;
 }
 
-int WasInterrupted(void* file) {
-    return static_cast<const InputFile*>(file)->Interrupted() ? 1 : 0;
+int WasInterrupted(void* interruption) {
+    return static_cast<const Interruption*>(interruption)->Interrupted() ? 1 : 0;
 }
 
 std::string CannotOpen(const std::string& path, const std::string& reason) {
@@ -41,8 +41,9 @@ std::string ReasonOf(int error) {
 
 } // namespace
 
-MovieFile::MovieFile(const std::string& path, bool playlists) try
-    : path_(path), companions_(path, playlists), bytes_(path) {
+MovieFile::MovieFile(const std::string& path, bool playlists,
+                     const std::shared_ptr<const Interruption>& interruption) try
+    : path_(path), companions_(path, playlists, interruption), bytes_(path, interruption) {
     // The prefix keeps a colon in the name from being read as a protocol.
     const std::string url = "file:" + path;
     Open(url, Recognise(url, playlists));
@@ -87,7 +88,7 @@ void MovieFile::Open(const std::string& url, const AVInputFormat& format) {
     if (context == nullptr)
         throw std::bad_alloc();
     context->pb = bytes_.Io();
-    context->interrupt_callback = {WasInterrupted, &bytes_};
+    context->interrupt_callback = {WasInterrupted, const_cast<Interruption*>(&bytes_.Interrupter())};
     companions_.Guard(*context);
     int result = avformat_open_input(&context, url.c_str(), &format, settings.Get());
     av::CheckMemory(result);

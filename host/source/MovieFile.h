@@ -8,17 +8,20 @@
 #include "host/source/InputFile.h"
 
 #include <cstdint>
+#include <memory>
 #include <string>
 
 namespace movieconv {
 
-/// One thread at a time reads from it; Interrupt may be called from any.
+/// One thread at a time reads from it.
 class MovieFile {
 public:
     /// Opens `path` (bytes as the system has them) and finds out which streams there are. A movie is one
     /// file: what names other files is opened only if `playlists`, and then may name only movies in its own
-    /// folder and below. Throws SourceError, PlaylistError for a playlist that was not allowed.
-    MovieFile(const std::string& path, bool playlists);
+    /// folder and below. `interruption` ends this, too. Throws SourceError, PlaylistError for a playlist
+    /// that was not allowed.
+    MovieFile(const std::string& path, bool playlists,
+              const std::shared_ptr<const Interruption>& interruption);
     MovieFile(const MovieFile&) = delete;
     MovieFile& operator=(const MovieFile&) = delete;
 
@@ -35,9 +38,6 @@ public:
 
     /// Why a file that the source names was not read; empty when all were.
     const std::string& Refusal() const { return companions_.Refusal(); }
-
-    /// Makes every read fail from now on, also one that is under way.
-    void Interrupt() { bytes_.Interrupt(); }
 
 private:
     const AVInputFormat& Recognise(const std::string& url, bool playlists);

@@ -8,8 +8,11 @@
 
 namespace movieconv {
 
-MovieReader::MovieReader(const std::string& path, bool playlists)
-    : path_(path), playlists_(playlists), file_(std::make_unique<MovieFile>(path, playlists)) {
+MovieReader::MovieReader(const std::string& path, bool playlists, std::shared_ptr<Interruption> interruption)
+    : path_(path),
+      playlists_(playlists),
+      interruption_(std::move(interruption)),
+      file_(std::make_unique<MovieFile>(path, playlists, interruption_)) {
     if (const int64_t start = Context()->start_time; start != AV_NOPTS_VALUE)
         start_ = av_rescale_q(start, {1, AV_TIME_BASE}, {1, kTicksPerSecond});
 }
@@ -64,7 +67,7 @@ bool MovieReader::Rewind() {
 }
 
 void MovieReader::Reopen() {
-    auto again = std::make_unique<MovieFile>(path_, playlists_);
+    auto again = std::make_unique<MovieFile>(path_, playlists_, interruption_);
     const int last = selected_.empty() ? -1 : *std::max_element(selected_.begin(), selected_.end());
     if (last >= static_cast<int>(again->Context()->nb_streams))
         throw SourceError("\"" + path_ + "\" has changed meanwhile");

@@ -13,11 +13,11 @@
 
 namespace movieconv {
 
-/// One thread at a time reads; Interrupt may be called from any, but not during Rewind or Reopen.
+/// One thread at a time reads; Interrupt may be called from any.
 class MovieReader {
 public:
     /// Opens as MovieFile does. Throws SourceError.
-    MovieReader(const std::string& path, bool playlists);
+    MovieReader(const std::string& path, bool playlists, std::shared_ptr<Interruption> interruption);
 
     /// Streams are the context's only until Rewind or Reopen, their numbers stay.
     AVFormatContext* Context() const { return file_->Context(); }
@@ -42,11 +42,12 @@ public:
     void Reopen();
 
     /// Makes every read fail from now on, also one that is under way.
-    void Interrupt() { file_->Interrupt(); }
+    void Interrupt() { interruption_->Interrupt(); }
 
 private:
     const std::string path_;
     const bool playlists_;
+    const std::shared_ptr<Interruption> interruption_;
     std::unique_ptr<MovieFile> file_;
     int64_t start_ = 0;
     std::vector<int> selected_;

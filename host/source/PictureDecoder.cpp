@@ -43,7 +43,8 @@ PictureDecoder::PictureDecoder(const Source& source, Demuxer& demuxer, Failures&
              {L"Movie::The picture decoder waits for the conversion",
               L"Movie::The conversion waits for the picture decoder"}) {
     const PictureStreamInfo& pictures = *source.Info().pictures;
-    info_.format = {pictures.width, pictures.height, pictures.frameRate, pictures.duration};
+    info_.format = {pictures.width, pictures.height, pictures.frameRate,
+                    std::max(pictures.duration, kShortestTold)};
 }
 
 PictureDecoder::~PictureDecoder() {

@@ -56,7 +56,8 @@ SoundDecoder::SoundDecoder(const Source& source, Demuxer& demuxer, Failures& fai
     frameBytes_ = static_cast<int64_t>(sound.channels) * sound.bitsPerSample / 8;
     blockBytes_ = BlockSamples(source.Info()) * frameBytes_;
     info_.format = {sound.sampleRate, sound.channels, sound.bitsPerSample,
-                    static_cast<int32_t>(sound.sampleRate * frameBytes_), sound.duration};
+                    static_cast<int32_t>(sound.sampleRate * frameBytes_),
+                    std::max(sound.duration, kShortestTold)};
     CopyLayout(*outputLayout_.Get(), source.SoundStream()->codecpar->ch_layout);
 }
 

@@ -12,8 +12,6 @@
 namespace movieconv {
 namespace {
 
-constexpr double kShortestStream = 0.001; // the engine takes a shorter one for absent
-
 std::string NothingToConvert(const std::string& path, const SourceChoice& choice) {
     return fmt::format("\"{}\" holds no {} that can be decoded", path,
                        choice.pictures && choice.sound ? "pictures and no sound"
@@ -23,7 +21,9 @@ std::string NothingToConvert(const std::string& path, const SourceChoice& choice
 
 } // namespace
 
-Source::Source(const std::string& path, const SourceChoice& choice) : reader_(path, choice.playlists) {
+Source::Source(const std::string& path, const SourceChoice& choice,
+               std::shared_ptr<Interruption> interruption)
+    : reader_(path, choice.playlists, std::move(interruption)) {
     AVFormatContext& context = *reader_.Context();
     info_.path = path;
     info_.bytes = reader_.File().Bytes();
@@ -58,8 +58,6 @@ void Source::Probe() {
         StreamOf(info_.pictures->index).pictures = info_.pictures;
     if (info_.sound)
         StreamOf(info_.sound->index).sound = info_.sound;
-    if (info_.sound && info_.pictures && info_.sound->duration < kShortestStream)
-        info_.sound.reset();
 }
 
 StreamInfo& Source::StreamOf(int index) {

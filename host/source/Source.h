@@ -6,6 +6,7 @@
 #include "host/source/SourceError.h"
 #include "host/source/SourceInfo.h"
 
+#include <memory>
 #include <string>
 
 namespace movieconv {
@@ -14,8 +15,9 @@ namespace movieconv {
 class Source {
 public:
     /// Opens `path` (bytes as the system has them) and chooses what is converted. Throws SourceError,
-    /// PlaylistError for a playlist that was not allowed.
-    Source(const std::string& path, const SourceChoice& choice);
+    /// PlaylistError for a playlist that was not allowed. `interruption` ends this, too.
+    Source(const std::string& path, const SourceChoice& choice,
+           std::shared_ptr<Interruption> interruption = std::make_shared<Interruption>());
     Source(const Source&) = delete;
     Source& operator=(const Source&) = delete;
 

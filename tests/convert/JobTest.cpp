@@ -10,8 +10,11 @@
 #include <algorithm>
 #include <condition_variable>
 #include <deque>
+#include <fcntl.h>
 #include <filesystem>
 #include <mutex>
+#include <sys/stat.h>
+#include <unistd.h>
 
 namespace {
 
@@ -139,6 +142,49 @@ TEST(Job, PausesAndStops) {
     const std::size_t pictures = LookAt(folder / "out.mp4").pictures.size();
     EXPECT_GT(pictures, 0u);
     EXPECT_LT(pictures, 1500u);
+}
+
+// A pipe that brings too little to tell what it holds.
+TEST(Job, StopsWhileItsSourceIsOpened) {
+    const Folder folder;
+    const std::string pipe = folder / "pipe";
+    ASSERT_EQ(mkfifo(pipe.c_str(), 0600), 0);
+    for (const bool written : {false, true}) {
+        Listener listener;
+        auto job = std::make_unique<Job>(Converting(pipe, folder / "out.mp4"), listener);
+        job->Start();
+        int end = -1;
+        while ((end = open(pipe.c_str(), O_WRONLY | O_NONBLOCK | O_CLOEXEC)) < 0)
+            std::this_thread::yield(); // until it is opened for reading
+        if (written) {
+            EXPECT_EQ(write(end, "G", 1), 1);
+        }
+        job->Stop();
+        job->Wait();
+        close(end);
+        EXPECT_EQ(job->Result()->outcome, Outcome::kStopped) << TextOf(*job->Result());
+        job.reset(); // after all news
+        EXPECT_EQ(listener.starts, 0);
+        EXPECT_EQ(listener.ends, 1);
+    }
+    EXPECT_EQ(folder.Names(), Args{"pipe"});
+}
+
+TEST(Job, LosesNoSoundHoweverShort) {
+    const Args oneSample{"-f", "lavfi", "-i", "aevalsrc=0.5,atrim=end_sample=1"};
+    const Args picture{"-f", "lavfi", "-i", "color=size=64x48:rate=25:duration=0.04", "-c:a", "pcm_s16le"};
+    for (const std::string& source :
+         {Make("one-sample.wav", oneSample), Make("one-sample.mov", Join(oneSample, picture))}) {
+        const Folder folder;
+        Listener listener;
+        Request request = Converting(source, folder / "out.mkv");
+        request.audioCodec = FourCC("PCM ");
+        const Verdict verdict = Convert(request, listener);
+        EXPECT_EQ(verdict.outcome, Outcome::kDone) << TextOf(verdict);
+        const std::vector<int16_t> sound = LookAt(folder / "out.mkv").sound;
+        ASSERT_FALSE(sound.empty());
+        EXPECT_NEAR(sound.front(), 16384, 1);
+    }
 }
 
 // Nobody tells whether what is written still has a name: the conversion has to look, and has to prove at its
