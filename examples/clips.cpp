@@ -60,16 +60,15 @@ int main(int argc, char** argv) {
     MCResult result = {};
     result.nSize = sizeof result;
     MCGetResult(converter, &result);
-    std::printf("%d clips are complete, %lld of %d pictures:\n", result.nFilesComplete,
-                static_cast<long long>(result.llPicturesWritten), Fade::kPictures);
+    std::printf("%d clips are complete:\n", result.nFilesComplete);
     wchar_t clip[MC_MAX_TARGET_NAME];
     for (int i = 0; i < result.nFilesComplete && MCGetTargetFileName(converter, clip, i) != 0; ++i)
         std::printf("  %s\n", Text(clip).c_str());
     MCDestroy(converter);
 
     if (result.nCategory == MC_RESULT_NO_SPACE)
-        std::fprintf(stderr, "The disk is full. Make room and convert again from there.\n%s\n",
-                     result.szWhat);
+        std::fprintf(stderr, "The disk is full. Make room and convert again from second %d on.\n%s\n",
+                     result.nFilesComplete, result.szWhat);
     else if (!result.bDone)
         std::fprintf(stderr, "%s: %s\n", result.szPath, result.szWhat);
     return result.bDone ? 0 : 1;
