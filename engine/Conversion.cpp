@@ -54,8 +54,8 @@ WriterStatus FileStatus() {
 
 /// What is wrong with a picture that was not taken, as far as it shows.
 const char* FaultOf(const VideoImage& picture) {
-    if (picture.nFormat != kPictureFormatPlanar420)
-        return "A picture was not taken: its format is not planar 4:2:0 (nFormat 2).";
+    if (picture.nFormat != kPictureFormatPlanar420 && picture.nFormat != kPictureFormatPlanar420Deep)
+        return "A picture was not taken: its format is not planar 4:2:0 (nFormat 2 or 10).";
     if (!picture.pY || !picture.pU || !picture.pV)
         return "A picture was not taken: one of its planes is null.";
     if (picture.nWidth <= 0 || picture.nHeight <= 0)

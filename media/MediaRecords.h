@@ -47,16 +47,18 @@ typedef struct AudioSourceInfo {
 } AudioSourceInfo;
 
 enum {
-    kMediaTypePicture = 1,      ///< VideoImage::nType of a picture.
-    kMediaTypeSound = 2,        ///< AudioFrame::nType of sound.
-    kMediaTypeSilence = 3,      ///< AudioFrame::nType of the silence that the engine makes itself.
-    kPictureFormatPlanar420 = 2 ///< VideoImage::nFormat of planar YUV 4:2:0.
+    kMediaTypePicture = 1,       ///< VideoImage::nType of a picture.
+    kMediaTypeSound = 2,         ///< AudioFrame::nType of sound.
+    kMediaTypeSilence = 3,       ///< AudioFrame::nType of the silence that the engine makes itself.
+    kPictureFormatPlanar420 = 2, ///< VideoImage::nFormat of planar YUV 4:2:0.
+    /// Likewise of 10 bits, each sample in the lower bits of a 16-bit word. Pitches still count bytes.
+    kPictureFormatPlanar420Deep = 10
 };
 
 /// One decoded picture: 76 bytes in the 32-bit build, 88 in the 64-bit one.
 typedef struct VideoImage {
     int32_t nType;              ///< kMediaTypePicture.
-    int32_t nFormat;            ///< Pixel layout, kPictureFormatPlanar420.
+    int32_t nFormat;            ///< Pixel layout, kPictureFormatPlanar420 or ...Deep.
     unsigned char* pY;          ///< Luma plane.
     unsigned char* pU;          ///< Cb plane, half width and half height.
     unsigned char* pV;          ///< Cr plane, half width and half height.

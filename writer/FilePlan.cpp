@@ -76,6 +76,16 @@ void SetCompression(PictureSettings& settings, const PictureCodec& codec, const 
     settings.quality = options.dQuality;
 }
 
+/// The format of the pictures that the encoder gets, by the depth that is asked for.
+AVPixelFormat ChooseDepth(const PictureCodec& codec, const WriterOptions& options) {
+    constexpr int kDeep = 10;
+    const bool deep = options.nDepth == kDeep;
+    if ((options.nDepth != 0 && options.nDepth != 8 && !deep) || (deep && !TakesDeep(codec)))
+        throw WriterFailure(kWriterErrorArgument, "\"" + CodeText(codec.code) + "\" has no pictures of " +
+                                                      std::to_string(options.nDepth) + " bits.");
+    return deep ? AV_PIX_FMT_YUV420P10 : codec.format;
+}
+
 PictureSettings MakePictureSettings(const EncodeParam& param, const VideoFormat& source,
                                     const PictureCodec& codec, const WriterOptions& options) {
     PictureSettings settings{};
@@ -96,6 +106,8 @@ PictureSettings MakePictureSettings(const EncodeParam& param, const VideoFormat&
     settings.primaries = ColorCode<AVColorPrimaries>(options.nColorPrimaries, AVCOL_PRI_NB);
     settings.transfer = ColorCode<AVColorTransferCharacteristic>(options.nColorTransfer, AVCOL_TRC_NB);
     settings.matrix = ColorCode<AVColorSpace>(options.nColorMatrix, AVCOL_SPC_NB);
+    settings.format = ChooseDepth(codec, options);
+    settings.light = LightOf(options);
     return settings;
 }
 
@@ -118,7 +130,7 @@ PicturePlan MakePicturePlan(const EncodeParam& param, const VideoFormat& source,
         plan.settings.sampleAspect =
             FitPicture(source.nWidth, source.nHeight, plan.sourceAspect, width, height, plan.stretch)
                 .sampleAspect;
-    plan.picture = {width, height, 0, 0, plan.codec->format, plan.sourceFullRange};
+    plan.picture = {width, height, 0, 0, plan.settings.format, plan.sourceFullRange};
     if (plan.codec->evenSize) {
         plan.picture.padWidth = width % 2;
         plan.picture.padHeight = height % 2;
@@ -127,7 +139,6 @@ PicturePlan MakePicturePlan(const EncodeParam& param, const VideoFormat& source,
     }
     if (plan.codec->format == AV_PIX_FMT_YUVJ420P)
         plan.picture.fullRange = true;
-    plan.settings.format = plan.picture.format;
     plan.settings.fullRange = plan.picture.fullRange;
     plan.settings.inOrder = container.kind == ContainerKind::kSteadyRate;
     plan.clock = MakePictureClock(plan.settings.rate, container.kind == ContainerKind::kSteadyRate);

@@ -56,16 +56,16 @@ constexpr const char* kVpxOptions = "deadline=good";
 constexpr const char* kFfv1Options = "level=3,g=1,slicecrc=1"; // every picture by itself, with a check sum
 
 constexpr std::array kPictureCodecs{
-    PictureCodec{kXvid,  AV_CODEC_ID_MPEG4,      "mpeg4",      kPlanar,     false, 0.0, kQuantiser, kOneSpeed, ""},
-    PictureCodec{kH264,  AV_CODEC_ID_H264,       "libx264",    kPlanar,     true,  1.5, kCrf51, kX26Speeds, ""},
-    PictureCodec{kHevc,  AV_CODEC_ID_HEVC,       "libx265",    kPlanar,     true,  0.0, kCrf51, kX26Speeds, kX265Options},
-    PictureCodec{kMjpg,  AV_CODEC_ID_MJPEG,      "mjpeg",      kPlanarFull, false, 0.0, kQuantiser, kOneSpeed, ""},
-    PictureCodec{kVp8,   AV_CODEC_ID_VP8,        "libvpx",     kPlanar,     false, 1.0, kCapped63, kVpxSpeeds, kVpxOptions},
-    PictureCodec{kVp9,   AV_CODEC_ID_VP9,        "libvpx-vp9", kPlanar,     false, 1.0, kCrf63, kVpxSpeeds, kVpxOptions},
-    PictureCodec{kAv1,   AV_CODEC_ID_AV1,        "libsvtav1",  kPlanar,     true,  0.0, kCrf63, kAv1Speeds, ""},
-    PictureCodec{kFfv1,  AV_CODEC_ID_FFV1,       "ffv1",       kPlanar,     false, 1.0, kNoQuality, kOneSpeed, kFfv1Options},
-    PictureCodec{kMpeg2, AV_CODEC_ID_MPEG2VIDEO, "mpeg2video", kPlanar,     false, 0.0, kQuantiser, kOneSpeed, ""},
-    PictureCodec{kFlv1,  AV_CODEC_ID_FLV1,       "flv",        kPlanar,     false, 0.0, kQuantiser, kOneSpeed, ""},
+    PictureCodec{kXvid,  AV_CODEC_ID_MPEG4,      "mpeg4",      kPlanar,     false, false, 0.0, kQuantiser, kOneSpeed, ""},
+    PictureCodec{kH264,  AV_CODEC_ID_H264,       "libx264",    kPlanar,     false, true,  1.5, kCrf51, kX26Speeds, ""},
+    PictureCodec{kHevc,  AV_CODEC_ID_HEVC,       "libx265",    kPlanar,     true,  true,  0.0, kCrf51, kX26Speeds, kX265Options},
+    PictureCodec{kMjpg,  AV_CODEC_ID_MJPEG,      "mjpeg",      kPlanarFull, false, false, 0.0, kQuantiser, kOneSpeed, ""},
+    PictureCodec{kVp8,   AV_CODEC_ID_VP8,        "libvpx",     kPlanar,     false, false, 1.0, kCapped63, kVpxSpeeds, kVpxOptions},
+    PictureCodec{kVp9,   AV_CODEC_ID_VP9,        "libvpx-vp9", kPlanar,     true,  false, 1.0, kCrf63, kVpxSpeeds, kVpxOptions},
+    PictureCodec{kAv1,   AV_CODEC_ID_AV1,        "libsvtav1",  kPlanar,     true,  true,  0.0, kCrf63, kAv1Speeds, ""},
+    PictureCodec{kFfv1,  AV_CODEC_ID_FFV1,       "ffv1",       kPlanar,     true,  false, 1.0, kNoQuality, kOneSpeed, kFfv1Options},
+    PictureCodec{kMpeg2, AV_CODEC_ID_MPEG2VIDEO, "mpeg2video", kPlanar,     false, false, 0.0, kQuantiser, kOneSpeed, ""},
+    PictureCodec{kFlv1,  AV_CODEC_ID_FLV1,       "flv",        kPlanar,     false, false, 0.0, kQuantiser, kOneSpeed, ""},
 };
 
 // The limits of AAC are the format's (6144 bits for a frame of 1024 samples), those of the others their encoders'.
@@ -215,6 +215,16 @@ const PictureCodec* FindPictureCodec(const Container& container, uint32_t code) 
 
 const SoundCodec* FindSoundCodec(const Container& container, uint32_t code) {
     return FindFitting(kSoundCodecs, container.audio, code);
+}
+
+bool TakesDeep(const PictureCodec& codec) {
+    const AVCodec* encoder = codec.deep ? FindEncoder(codec) : nullptr;
+    if (encoder == nullptr || encoder->pix_fmts == nullptr)
+        return false;
+    const AVPixelFormat* format = encoder->pix_fmts;
+    while (*format != AV_PIX_FMT_NONE && *format != AV_PIX_FMT_YUV420P10)
+        ++format;
+    return *format != AV_PIX_FMT_NONE;
 }
 
 const AVCodec* FindEncoder(const PictureCodec& codec) {

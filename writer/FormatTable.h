@@ -40,6 +40,7 @@ struct PictureCodec {
     AVCodecID id;
     const char* encoder;
     AVPixelFormat format; ///< Of the pictures that the encoder gets; a "J" format: luma covers 0 to 255.
+    bool deep;            ///< Pictures of 10 bits are taken as well.
     bool evenSize;        ///< Odd widths and heights are not accepted.
     /// Threads for each processor where the caller leaves the choice: 0 for one thread. The output depends on
     /// their number, never on timing.
@@ -101,6 +102,9 @@ const SoundCodec* FindSoundCodec(const Container& container, uint32_t code);
 
 /// The codec of that code, whatever carries it; null when there is none.
 const PictureCodec* FindPictureCodec(uint32_t code);
+
+/// Whether this FFmpeg build's encoder takes pictures of 10 bits.
+bool TakesDeep(const PictureCodec& codec);
 
 /// This FFmpeg build's encoder; null when it has none. `bitsPerSample` chooses among those for PCM.
 const AVCodec* FindEncoder(const PictureCodec& codec);

@@ -13,16 +13,19 @@
 namespace writer {
 namespace {
 
-constexpr int kPlanar420 = kPictureFormatPlanar420;
-
 /// Stretches of sound are handed on when they are this long, in parts of a second.
 constexpr int kStretchesPerSecond = 20;
 
 bool Usable(const VideoImage& image) {
-    return image.nFormat == kPlanar420 && image.pY != nullptr && image.pU != nullptr && image.pV != nullptr &&
-           image.nWidth > 0 && image.nHeight > 0 && image.nWidth <= 32768 && image.nHeight <= 32768 &&
-           std::abs(image.nPitchY) >= image.nWidth && std::abs(image.nPitchU) >= (image.nWidth + 1) / 2 &&
-           std::abs(image.nPitchV) >= (image.nWidth + 1) / 2;
+    const int32_t format = image.nFormat;
+    if (format != kPictureFormatPlanar420 && format != kPictureFormatPlanar420Deep)
+        return false;
+    const int sampleBytes = format == kPictureFormatPlanar420Deep ? 2 : 1;
+    return image.pY != nullptr && image.pU != nullptr && image.pV != nullptr && image.nWidth > 0 &&
+           image.nHeight > 0 && image.nWidth <= 32768 && image.nHeight <= 32768 &&
+           std::abs(image.nPitchY) >= image.nWidth * sampleBytes &&
+           std::abs(image.nPitchU) >= (image.nWidth + 1) / 2 * sampleBytes &&
+           std::abs(image.nPitchV) >= (image.nWidth + 1) / 2 * sampleBytes;
 }
 
 /// What the host says in a record's reserved bytes about its place in the source.
@@ -42,11 +45,12 @@ EncoderFlags FlagsFor(const FilePlan& plan) {
 }
 
 int AddEncoder(Muxer& muxer, const AVCodecContext& context, AVRational unit, AVRational rate, int64_t runUp,
-               const Carriage& carriage) {
+               const Carriage& carriage, const HdrLight* light = nullptr) {
     const av::CodecParameters parameters(avcodec_parameters_alloc());
     if (!parameters || avcodec_parameters_from_context(parameters.get(), &context) < 0)
         throw std::bad_alloc();
-    return muxer.AddStream({parameters.get(), unit, rate, context.sample_aspect_ratio, runUp, &carriage});
+    return muxer.AddStream(
+        {parameters.get(), unit, rate, context.sample_aspect_ratio, runUp, &carriage, light});
 }
 
 /// Where the file's data really goes. Throws WriterFailure when nothing may be written there.
@@ -91,9 +95,11 @@ void MediaFile::OpenStages() {
         pictures_ = std::make_unique<PictureStage>(*plan_.pictures, flags);
         const AVCodecContext& encoder = pictures_->Encoder();
         const PictureClock& clock = plan_.pictures->clock;
-        pictureStream_ = AddEncoder(part_.Streams(), encoder, clock.tick, clock.rate,
-                                    int64_t{encoder.has_b_frames} * clock.ticksPerPicture,
-                                    FindCarriage(*plan_.container, plan_.pictures->codec->code));
+        pictureStream_ =
+            AddEncoder(part_.Streams(), encoder, clock.tick, clock.rate,
+                       int64_t{encoder.has_b_frames} * clock.ticksPerPicture,
+                       FindCarriage(*plan_.container, plan_.pictures->codec->code),
+                       plan_.pictures->settings.light ? &*plan_.pictures->settings.light : nullptr);
     }
     if (plan_.sound) {
         sound_ = std::make_unique<SoundStage>(*plan_.sound, flags);

@@ -153,6 +153,11 @@ uint32_t MWFindCodec(uint32_t format, uint32_t code, int forSound) {
     return codec != nullptr && writer::FindEncoder(*codec) != nullptr ? codec->code : 0;
 }
 
+int MWGetPictureDepth(uint32_t code) {
+    const writer::PictureCodec* codec = writer::FindPictureCodec(code);
+    return codec == nullptr ? 0 : writer::TakesDeep(*codec) ? 10 : 8;
+}
+
 int MWSetOptions(uint32_t set, const WriterOptions* options) {
     return WithSet(set, [&](OptionSet& found) {
         const auto known = writer::ReadOptions(options);

@@ -97,7 +97,9 @@ int Muxer::AddStream(const MuxedStream& stream) {
     made->time_base = stream.unit;
     made->avg_frame_rate = stream.rate;
     made->sample_aspect_ratio = stream.sampleAspect;
-    streams_.push_back({stream.unit, stream.runUp, stream.carriage});
+    if (stream.light != nullptr)
+        AddLight(*made, *stream.light);
+    streams_.push_back({stream.unit, stream.runUp, stream.carriage, stream.light});
     return made->index;
 }
 
@@ -319,11 +321,11 @@ Muxer::Written Muxer::Stream(int stream) const {
     const AVStream* out = output_->streams[stream];
     const int64_t length = state.endPts - state.firstPts - out->codecpar->initial_padding;
     const int64_t runUp = av_rescale_q(state.runUp, state.unit, out->time_base);
-    return {
-        {out->codecpar, out->time_base, out->avg_frame_rate, out->sample_aspect_ratio, runUp, state.carriage},
-        state.delay,
-        state.packets,
-        static_cast<double>(std::max<int64_t>(0, length)) * av_q2d(state.unit)};
+    return {{out->codecpar, out->time_base, out->avg_frame_rate, out->sample_aspect_ratio, runUp,
+             state.carriage, state.light},
+            state.delay,
+            state.packets,
+            static_cast<double>(std::max<int64_t>(0, length)) * av_q2d(state.unit)};
 }
 
 bool Muxer::Empty() const {

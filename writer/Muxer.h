@@ -6,6 +6,7 @@
 #include "writer/AvioFile.h"
 #include "writer/Extras.h"
 #include "writer/FormatTable.h"
+#include "writer/HdrLight.h"
 
 #include <condition_variable>
 #include <cstdint>
@@ -23,6 +24,7 @@ struct MuxedStream {
     AVRational sampleAspect;             ///< Shape of the pixels; 0/1 for sound.
     int64_t runUp;                       ///< How far below 0 times can begin, in the unit.
     const Carriage* carriage;            ///< How the container carries its codec.
+    const HdrLight* light = nullptr;     ///< Of HDR pictures, which lives as long as the muxer; may be null.
 };
 
 /// Streams are added, the header is written, then packets come from any thread, then the end.
@@ -84,6 +86,7 @@ private:
         AVRational unit{0, 1};
         int64_t runUp = 0;
         const Carriage* carriage = nullptr;
+        const HdrLight* light = nullptr;
         int64_t delay = 0; ///< In the file's unit.
         int64_t lastDts = AV_NOPTS_VALUE;
         int64_t packets = 0;

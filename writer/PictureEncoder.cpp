@@ -30,6 +30,17 @@ void SetOptions(AVCodecContext& context, const std::string& options) {
     }
 }
 
+/// The parameters of x265 among `options`, with what it is to say about the light.
+std::string LightParameters(const std::string& options, const HdrLight& light) {
+    std::string parameters = options.substr(options.find('=') + 1);
+    if (light.display)
+        parameters += ":master-display=" + MasteringText(*light.display);
+    if (light.brightestPixel > 0 || light.brightestPicture > 0)
+        parameters +=
+            ":max-cll=" + std::to_string(light.brightestPixel) + "," + std::to_string(light.brightestPicture);
+    return parameters;
+}
+
 void SetSpeed(AVCodecContext& context, const SpeedScale& scale, const PictureSettings& settings) {
     if (scale.option == nullptr)
         return;
@@ -88,6 +99,8 @@ PictureEncoder::PictureEncoder(const PictureCodec& codec, const PictureSettings&
     context.color_trc = settings.transfer;
     context.colorspace = settings.matrix;
     SetOptions(context, codec.options);
+    if (settings.light && codec.id == AV_CODEC_ID_HEVC) // which also tells it in its own stream
+        SetOption(context, "x265-params", LightParameters(codec.options, *settings.light));
     SetSpeed(context, codec.speed, settings);
     if (settings.profile != nullptr)
         SetOption(context, "profile", settings.profile);

@@ -4,6 +4,7 @@
 
 #include "writer/Encoder.h"
 #include "writer/FormatTable.h"
+#include "writer/HdrLight.h"
 
 #include <cstdint>
 #include <deque>
@@ -29,6 +30,7 @@ struct PictureSettings {
     AVColorPrimaries primaries;
     AVColorTransferCharacteristic transfer;
     AVColorSpace matrix;
+    std::optional<HdrLight> light;
 };
 
 /// The encoder itself only counts pictures, so that its rate control sees a steady rate and no codec's limits

@@ -47,15 +47,17 @@ void PaintBlack(AVFrame& frame, const PictureFit& fit, bool fullRange) {
 }
 
 /// Repeats the last column and row of a picture that is `padWidth` and `padHeight` smaller than its frame.
+template <typename Sample>
 void RepeatEdges(AVFrame& frame, int padWidth, int padHeight) {
     // One more luma column or row never adds a chroma sample: 4:2:0 rounds up.
     for (int row = 0; padWidth > 0 && row < frame.height; ++row) {
-        uint8_t* end = frame.data[0] + static_cast<ptrdiff_t>(row) * frame.linesize[0] + frame.width - 1;
+        uint8_t* pixels = frame.data[0] + static_cast<ptrdiff_t>(row) * frame.linesize[0];
+        auto* end = reinterpret_cast<Sample*>(pixels) + frame.width - 1;
         end[0] = end[-1];
     }
     if (padHeight > 0) {
         uint8_t* last = frame.data[0] + static_cast<ptrdiff_t>(frame.height - 1) * frame.linesize[0];
-        std::memcpy(last, last - frame.linesize[0], static_cast<size_t>(frame.width));
+        std::memcpy(last, last - frame.linesize[0], static_cast<size_t>(frame.width) * sizeof(Sample));
     }
 }
 
@@ -128,22 +130,28 @@ av::Frame PictureScaler::Convert(av::Frame picture) {
         pool_.Get(output_.format, output_.width + output_.padWidth, output_.height + output_.padHeight);
     av_frame_copy_props(frame.get(), picture.get());
     PaintBlack(*frame, fit_, output_.fullRange);
-    uint8_t* planes[4] = {frame->data[0] + static_cast<ptrdiff_t>(fit_.top) * frame->linesize[0] + fit_.left};
+    const bool deep = output_.format == AV_PIX_FMT_YUV420P10;
+    const int sampleBytes = deep ? 2 : 1;
+    uint8_t* planes[4] = {frame->data[0] + static_cast<ptrdiff_t>(fit_.top) * frame->linesize[0] +
+                          fit_.left * sampleBytes};
     for (int plane = 1; plane < 3; ++plane)
         planes[plane] = frame->data[plane] + static_cast<ptrdiff_t>(fit_.top / 2) * frame->linesize[plane] +
-                        fit_.left / 2;
+                        fit_.left / 2 * sampleBytes;
     if (sws_scale(scaler_.get(), picture->data, picture->linesize, 0, picture->height, planes,
                   frame->linesize) < 0)
         throw std::bad_alloc();
-    RepeatEdges(*frame, output_.padWidth, output_.padHeight);
+    const auto repeat = deep ? RepeatEdges<uint16_t> : RepeatEdges<uint8_t>;
+    repeat(*frame, output_.padWidth, output_.padHeight);
     return frame;
 }
 
 void PictureScaler::PrepareFor(const AVFrame& picture) {
-    if (scaler_ && picture.width == sourceWidth_ && picture.height == sourceHeight_)
+    if (scaler_ && picture.width == sourceWidth_ && picture.height == sourceHeight_ &&
+        picture.format == sourceFormat_)
         return;
     sourceWidth_ = picture.width;
     sourceHeight_ = picture.height;
+    sourceFormat_ = picture.format;
     fit_ = FitPicture(picture.width, picture.height, sampleAspect_, output_.width, output_.height, stretch_);
     scaler_.reset(sws_getContext(picture.width, picture.height, static_cast<AVPixelFormat>(picture.format),
                                  fit_.fittedWidth, fit_.fittedHeight, output_.format,

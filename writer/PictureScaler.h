@@ -46,7 +46,7 @@ private:
     int height_ = 0;
 };
 
-/// Not thread-safe. A change of size in mid-stream is taken as it comes.
+/// Not thread-safe. A change of size or depth in mid-stream is taken as it comes.
 class PictureScaler {
 public:
     /// Output pictures of `width` by `height`, or of one pixel more where `padWidth` and `padHeight` say so:
@@ -75,6 +75,7 @@ private:
     PictureFit fit_;
     int sourceWidth_ = 0;
     int sourceHeight_ = 0;
+    int sourceFormat_ = AV_PIX_FMT_NONE;
     av::Scaler scaler_;
     FramePool pool_;
 };

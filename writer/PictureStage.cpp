@@ -13,14 +13,16 @@ namespace {
 constexpr size_t kMostPictures = 1; // they are large
 
 av::Frame CopyPicture(FramePool& pool, const VideoImage& image) {
-    av::Frame frame = pool.Get(AV_PIX_FMT_YUV420P, image.nWidth, image.nHeight);
-    const int chromaWidth = (image.nWidth + 1) / 2;
+    const bool deep = image.nFormat == kPictureFormatPlanar420Deep;
+    av::Frame frame = pool.Get(deep ? AV_PIX_FMT_YUV420P10 : AV_PIX_FMT_YUV420P, image.nWidth, image.nHeight);
+    const int sampleBytes = deep ? 2 : 1;
+    const int chromaBytes = (image.nWidth + 1) / 2 * sampleBytes;
     const int chromaHeight = (image.nHeight + 1) / 2;
-    av_image_copy_plane(frame->data[0], frame->linesize[0], image.pY, image.nPitchY, image.nWidth,
-                        image.nHeight);
-    av_image_copy_plane(frame->data[1], frame->linesize[1], image.pU, image.nPitchU, chromaWidth,
+    av_image_copy_plane(frame->data[0], frame->linesize[0], image.pY, image.nPitchY,
+                        image.nWidth * sampleBytes, image.nHeight);
+    av_image_copy_plane(frame->data[1], frame->linesize[1], image.pU, image.nPitchU, chromaBytes,
                         chromaHeight);
-    av_image_copy_plane(frame->data[2], frame->linesize[2], image.pV, image.nPitchV, chromaWidth,
+    av_image_copy_plane(frame->data[2], frame->linesize[2], image.pV, image.nPitchV, chromaBytes,
                         chromaHeight);
     return frame;
 }

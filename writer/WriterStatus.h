@@ -129,6 +129,16 @@ typedef void (*WriterListener)(void* context, int event, const WriterStatus* sta
 /// full.
 typedef int (*WriterFullDiskHandler)(void* context, const WriterStatus* status);
 
+/// The display that HDR pictures were made for: chromaticities as in CIE 1931, luminances in cd/m2.
+typedef struct WriterMasteringDisplay {
+    double dRed[2]; ///< x, y
+    double dGreen[2];
+    double dBlue[2];
+    double dWhite[2];
+    double dDarkest;
+    double dBrightest;
+} WriterMasteringDisplay;
+
 /// Options for files; all zero but the size is the default.
 typedef struct WriterOptions {
     uint32_t nSize MW_SIZE_OF(WriterOptions); ///< Size of this record in bytes.
@@ -158,6 +168,13 @@ typedef struct WriterOptions {
     /// Seconds that each file will last when that is less than the source does, as clips; 0: not known. MP4,
     /// MOV and M4A leave room for their index by it.
     double dFileLength;
+    /// Bits of a picture's components: 8, which is also what 0 means, or 10 where the codec takes them; see
+    /// MWGetPictureDepth. Pictures that come with another depth are brought to it.
+    int32_t nDepth;
+    int32_t bMasteringDisplay; ///< Nonzero: `masteringDisplay` goes into the file.
+    WriterMasteringDisplay masteringDisplay;
+    int32_t nBrightestPixel;   ///< cd/m2 of the brightest pixel of all pictures; 0: not known.
+    int32_t nBrightestPicture; ///< cd/m2, the highest average of a picture; 0: not known.
 } WriterOptions;
 
 /// What distinguishes a file format beside what FileFormatInfo says.
@@ -251,6 +268,9 @@ uint32_t MWFindCodec(uint32_t format, uint32_t code, int forSound);
 /// The scale of a picture codec's constant quality, from the best figure to the worst. Returns 1; 0 when the
 /// codec has none or is not known.
 int MWGetQualityScale(uint32_t code, double* best, double* worst);
+
+/// Most bits of a component that a picture codec can be given, 8 or 10; 0 when it is not known.
+int MWGetPictureDepth(uint32_t code);
 
 #pragma GCC visibility pop
 #undef MW_SIZE_OF

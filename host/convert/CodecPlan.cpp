@@ -93,7 +93,32 @@ void PlanRate(PicturePlan& plan, const Request& request, int height) {
         plan.rate = preferences.videoRate;
 }
 
+uint32_t CodecOf(const std::optional<uint32_t>& chosen, const FileFormatInfo& format) {
+    return chosen.value_or(UsualVideoCodec(format));
+}
+
+void PlanDepth(PicturePlan& plan, const Request& request, const FileFormatInfo& format,
+               const PictureStreamInfo& source) {
+    const int most = MostDepth(request, format);
+    if (request.depth && *request.depth > most) {
+        throw Failure(Category::kRequest,
+                      fmt::format("\"{}\" has pictures of {} bits; HEVC, VP90 and AV01 have some of 10",
+                                  CodeName(CodecOf(plan.codec, format)), most));
+    }
+    if (request.hdr == Hdr::kKeep && IsHdr(source) && most <= 8) {
+        throw Failure(Category::kRequest, fmt::format("HDR needs pictures of 10 bits; \"{}\" has 8 here",
+                                                      CodeName(CodecOf(plan.codec, format))));
+    }
+    plan.keepsHdr = IsHdr(source) && most > 8 && request.hdr != Hdr::kSdr;
+    plan.depth = request.depth.value_or(source.depth > 8 || plan.keepsHdr ? most : 8);
+}
+
 } // namespace
+
+int MostDepth(const Request& request, const FileFormatInfo& format) {
+    const int codecs = MWGetPictureDepth(CodecOf(ChooseVideoCodec(request, format), format));
+    return std::clamp(request.depth.value_or(codecs), 8, std::max(codecs, 8));
+}
 
 std::optional<uint32_t> ChooseVideoCodec(const Request& request, const FileFormatInfo& format) {
     return ChooseCodec(request.videoCodec, request.preferences.videoCodecs, format, false);
@@ -120,6 +145,7 @@ PicturePlan PlanPictures(const Request& request, const FileFormatInfo& format,
         plan.frameRate = preferences.maxFrameRate;
     plan.speed = request.speed ? request.speed : preferences.speed;
     plan.profile = preferences.profile;
+    PlanDepth(plan, request, format, source);
     PlanRate(plan, request, plan.size ? plan.size->height : source.height);
     return plan;
 }

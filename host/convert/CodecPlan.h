@@ -21,6 +21,8 @@ struct PicturePlan {
     std::optional<int32_t> maxRate;
     std::optional<Speed> speed;
     std::optional<Profile> profile;
+    int depth = 8; ///< Bits of a component.
+    bool keepsHdr = false;
 };
 
 struct SoundPlan {
@@ -36,10 +38,13 @@ struct SoundPlan {
 std::optional<uint32_t> ChooseVideoCodec(const Request& request, const FileFormatInfo& format);
 std::optional<uint32_t> ChooseAudioCodec(const Request& request, const FileFormatInfo& format);
 
+/// Most bits that a component can have in the output's pictures, 8 or 10.
+int MostDepth(const Request& request, const FileFormatInfo& format);
+
 /// Whether the size of the output follows from bit rates.
 bool HasRates(const Request& request, const FileFormatInfo& format, const SourceInfo& source);
 
-/// Throws Failure as well when the codec has no such quality.
+/// Throws Failure as well when the codec has no such quality or depth.
 PicturePlan PlanPictures(const Request& request, const FileFormatInfo& format,
                          const PictureStreamInfo& source);
 SoundPlan PlanSound(const Request& request, const FileFormatInfo& format, const SoundStreamInfo& source);

@@ -53,6 +53,8 @@ Course::Course(const Request& request, Movie& movie, Wishes& wishes, Observer& o
       clock_(Now()) {
     if (request.length)
         movie.EndPicturesAt(request.begin + length_);
+    if (movie.KeepsHdr())
+        wishes.pictures.TakesHdr(*movie.Info().pictures);
 }
 
 Verdict Course::Run() {

@@ -1,7 +1,9 @@
 #include "host/convert/PictureTap.h"
 
 #include "Common/Image/ImageConvert.h"
+#include "host/source/SourceError.h"
 
+#include <algorithm>
 #include <new>
 #include <utility>
 
@@ -45,16 +47,50 @@ void PictureTap::Copy(const VideoImage& image) noexcept {
         fresh_ = false;
         latest_.width = image.nWidth;
         latest_.height = image.nHeight;
+        latest_.deep = image.nFormat == kPictureFormatPlanar420Deep;
         latest_.bytes.clear();
-        const auto width = static_cast<std::size_t>(image.nWidth);
+        const std::size_t sampleBytes = latest_.deep ? 2 : 1;
+        const auto width = static_cast<std::size_t>(image.nWidth) * sampleBytes;
         const auto height = static_cast<std::size_t>(image.nHeight);
+        const std::size_t chromaWidth = Half(image.nWidth) * sampleBytes;
         CopyPlane(latest_.bytes, image.pY, image.nPitchY, width, height);
-        CopyPlane(latest_.bytes, image.pU, image.nPitchU, Half(image.nWidth), Half(image.nHeight));
-        CopyPlane(latest_.bytes, image.pV, image.nPitchV, Half(image.nWidth), Half(image.nHeight));
+        CopyPlane(latest_.bytes, image.pU, image.nPitchU, chromaWidth, Half(image.nHeight));
+        CopyPlane(latest_.bytes, image.pV, image.nPitchV, chromaWidth, Half(image.nHeight));
         fresh_ = true;
     } catch (const std::bad_alloc&) {
         return;
     }
+}
+
+/// As usual displays show it: of 8 bits. Null when it cannot be made so.
+av::Frame PictureTap::Usual(const Planes& planes) {
+    av::Frame frame = av::NewFrame();
+    frame->format = planes.deep ? AV_PIX_FMT_YUV420P10 : AV_PIX_FMT_YUV420P;
+    frame->width = planes.width;
+    frame->height = planes.height;
+    if (av_frame_get_buffer(frame.get(), 0) < 0)
+        return nullptr;
+    const uint8_t* source = planes.bytes.data();
+    for (int plane = 0; plane < 3; ++plane) {
+        const std::size_t samples = plane == 0 ? static_cast<std::size_t>(planes.width) : Half(planes.width);
+        const std::size_t rows = plane == 0 ? static_cast<std::size_t>(planes.height) : Half(planes.height);
+        const std::size_t bytes = samples * (planes.deep ? 2 : 1);
+        for (std::size_t row = 0; row < rows; ++row, source += bytes)
+            std::copy_n(source, bytes,
+                        frame->data[plane] + static_cast<ptrdiff_t>(row) * frame->linesize[plane]);
+    }
+    if (!filter_)
+        return converter_.Convert(*frame);
+    av::Frame shown;
+    try {
+        filter_->Push(*frame, std::nullopt, [&](AVFrame& picture, std::optional<int64_t>) {
+            shown = av::NewFrame();
+            av_frame_move_ref(shown.get(), &picture);
+            return true;
+        });
+    } catch (const SourceError&) { // without filters
+    }
+    return shown;
 }
 
 std::shared_ptr<const ShownPicture> PictureTap::Take() {
@@ -76,6 +112,14 @@ std::shared_ptr<const ShownPicture> PictureTap::Take() {
     shown->width = taken_.width;
     shown->height = taken_.height;
     shown->bgra.resize(width * height * 4);
+    if (taken_.deep || filter_) {
+        const av::Frame usual = Usual(taken_);
+        if (!usual)
+            return nullptr;
+        Yuv420_2_Argb(&header, shown->bgra.data(), usual->data[0], usual->data[1], usual->data[2],
+                      usual->linesize[0], usual->linesize[1], usual->linesize[2]);
+        return shown;
+    }
     uint8_t* luma = taken_.bytes.data();
     uint8_t* blue = luma + width * height;
     uint8_t* red = blue + Half(taken_.width) * Half(taken_.height);

@@ -3,6 +3,8 @@
 #define MOVIECONV_HOST_CONVERT_PICTURETAP_H
 
 #include "host/convert/Observer.h"
+#include "host/source/PictureConverter.h"
+#include "host/source/PictureFilter.h"
 #include "media/MediaRecords.h"
 
 #include <atomic>
@@ -26,6 +28,12 @@ public:
     void SetInterval(Interval interval) { interval_ = interval ? interval->count() : kNone; }
     bool Wants() const { return interval_ != kNone; }
 
+    /// The pictures will be HDR ones as the source has them, to be shown on a usual display. Before the
+    /// first.
+    void TakesHdr(const PictureStreamInfo& source) {
+        filter_.emplace(source, SourceChoice{.deinterlace = Deinterlace::kNone});
+    }
+
     /// Copies a planar 4:2:0 picture unless the last one is too recent; without memory it is not shown. True
     /// when there is one to take now. Any thread.
     bool Offer(const VideoImage& image) noexcept;
@@ -42,17 +50,23 @@ private:
     struct Planes {
         int width = 0;
         int height = 0;
+        bool deep = false;
         std::vector<uint8_t> bytes; // Y, U, V without gaps
     };
 
     void Copy(const VideoImage& image) noexcept;
+    av::Frame Usual(const Planes& planes);
 
     std::atomic<int64_t> interval_; // milliseconds
     std::mutex mutex_;
     Planes latest_;
     bool fresh_ = false;
     Clock::time_point offered_{};
-    Planes taken_; // the taking thread's
+
+    // The taking thread's.
+    Planes taken_;
+    std::optional<PictureFilter> filter_;
+    PictureConverter converter_{0, false, false};
 };
 
 } // namespace movieconv

@@ -18,6 +18,10 @@ enum class OnFull { kStop, kWait };
 /// How pictures of another shape fill the output's: distorted, or with black borders.
 enum class Fit { kStretch, kBorders };
 
+/// What becomes of HDR pictures: they are kept, become usual ones, or are kept where the codec has pictures
+/// of 10 bits.
+enum class Hdr { kAuto, kKeep, kSdr };
+
 /// Names are bytes as the system has them. What is not given is left to the preferences, then to the engine's
 /// defaults and the source.
 struct Request {
@@ -41,6 +45,9 @@ struct Request {
     std::optional<int32_t> channels;
     std::optional<int32_t> sampleRate; ///< Samples per second and channel.
     Deinterlace deinterlace = Deinterlace::kFlagged;
+    Hdr hdr = Hdr::kAuto;
+    /// Bits of a picture's components, 8 or 10; by default the source's, as far as the codec has them.
+    std::optional<int> depth;
     /// Bytes that the output may have at most: chooses the rates, and where they are low a picture size.
     std::optional<int64_t> maxSize;
     bool noVideo = false;

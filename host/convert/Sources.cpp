@@ -1,5 +1,7 @@
 #include "host/convert/Sources.h"
 
+#include "host/convert/CodecPlan.h"
+#include "host/convert/EncodePlan.h"
 #include "host/convert/Failure.h"
 
 #include <utility>
@@ -12,6 +14,16 @@ SourceChoice ChoiceOf(const Request& request) {
             .sound = !request.noAudio,
             .deinterlace = request.deinterlace,
             .playlists = request.playlists};
+}
+
+/// With the pictures as the output takes them.
+SourceChoice ChoiceForOutput(const Request& request) {
+    SourceChoice choice = ChoiceOf(request);
+    if (request.output.empty())
+        return choice;
+    choice.deep = MostDepth(request, ChooseFormat(request)) > 8;
+    choice.keepHdr = choice.deep && request.hdr != Hdr::kSdr;
+    return choice;
 }
 
 /// What `open` gives, with its errors as failures.
@@ -29,7 +41,7 @@ auto Opened(Open open) {
 } // namespace
 
 Movie OpenMovie(const Request& request, std::shared_ptr<Interruption> interruption) {
-    return Opened([&] { return Movie(request.input, ChoiceOf(request), std::move(interruption)); });
+    return Opened([&] { return Movie(request.input, ChoiceForOutput(request), std::move(interruption)); });
 }
 
 SourceInfo LookAtSource(const Request& request) {

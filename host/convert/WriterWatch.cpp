@@ -24,6 +24,28 @@ bool LatestFile(uint32_t set, WriterStatus& status) {
     return MWGetFileStatus(set, MWGetFileCount(set), &status) != 0;
 }
 
+void TellColours(WriterOptions& writer, const PictureStreamInfo& pictures, bool keepsHdr) {
+    constexpr int kBt709 = 1;
+    const bool becomesSdr = IsHdr(pictures) && !keepsHdr;
+    writer.nColorPrimaries = becomesSdr ? kBt709 : pictures.colorPrimaries;
+    writer.nColorTransfer = becomesSdr ? kBt709 : pictures.colorTransfer;
+    writer.nColorMatrix = becomesSdr ? kBt709 : pictures.colorMatrix;
+    if (keepsHdr && pictures.masteringDisplay) {
+        const MasteringDisplay& display = *pictures.masteringDisplay;
+        writer.bMasteringDisplay = 1;
+        std::copy_n(display.red, 2, writer.masteringDisplay.dRed);
+        std::copy_n(display.green, 2, writer.masteringDisplay.dGreen);
+        std::copy_n(display.blue, 2, writer.masteringDisplay.dBlue);
+        std::copy_n(display.white, 2, writer.masteringDisplay.dWhite);
+        writer.masteringDisplay.dDarkest = display.darkest;
+        writer.masteringDisplay.dBrightest = display.brightest;
+    }
+    if (keepsHdr && pictures.lightLevel) {
+        writer.nBrightestPixel = pictures.lightLevel->brightestPixel;
+        writer.nBrightestPicture = pictures.lightLevel->brightestPicture;
+    }
+}
+
 } // namespace
 
 FileIdentity IdentityOf(const std::string& path) noexcept {
@@ -38,11 +60,6 @@ WriterWatch::WriterWatch(const Request& request, const SourceInfo& source, Bell&
     if (source.pictures) {
         writer.nSampleAspectNum = source.pictures->pixelAspect.num;
         writer.nSampleAspectDen = source.pictures->pixelAspect.den;
-        constexpr int kBt709 = 1;
-        const PictureStreamInfo& pictures = *source.pictures;
-        writer.nColorPrimaries = IsHdr(pictures) ? kBt709 : pictures.colorPrimaries;
-        writer.nColorTransfer = IsHdr(pictures) ? kBt709 : pictures.colorTransfer;
-        writer.nColorMatrix = IsHdr(pictures) ? kBt709 : pictures.colorMatrix;
     }
     if (const FileFormatInfo& format = ChooseFormat(request); source.pictures && format.bHasVideo != 0) {
         const PicturePlan plan = PlanPictures(request, format, *source.pictures);
@@ -50,6 +67,8 @@ WriterWatch::WriterWatch(const Request& request, const SourceInfo& source, Bell&
         writer.dQuality = plan.quality.value_or(0);
         writer.nSpeed = plan.speed ? static_cast<int32_t>(*plan.speed) : 0;
         writer.nProfile = plan.profile ? static_cast<int32_t>(*plan.profile) : 0;
+        writer.nDepth = plan.depth;
+        TellColours(writer, *source.pictures, plan.keepsHdr);
     }
     writer.bKeepExisting = request.overwrite ? 0 : 1;
     writer.bRemovePartial = request.keepPartial ? 0 : 1;

@@ -8,11 +8,12 @@
 namespace movieconv {
 
 Movie::Movie(const std::string& path, const SourceChoice& choice, std::shared_ptr<Interruption> interruption)
-    : source_(path, choice, std::move(interruption)),
+    : choice_(choice),
+      source_(path, choice, std::move(interruption)),
       failures_([this] { demuxer_.Stop(); }),
       demuxer_(source_, failures_) {
     if (source_.PictureStream() != nullptr)
-        pictures_ = std::make_unique<PictureDecoder>(source_, demuxer_, failures_, choice.deinterlace);
+        pictures_ = std::make_unique<PictureDecoder>(source_, demuxer_, failures_, choice);
     if (source_.SoundStream() != nullptr)
         sound_ = std::make_unique<SoundDecoder>(source_, demuxer_, failures_);
 }
@@ -46,8 +47,10 @@ std::vector<std::string> Movie::Complaints() const {
         texts.push_back(source_.LeftOut());
     if (pictures_ && pictures_->Deinterlaced())
         texts.emplace_back("interlaced pictures were made progressive");
-    if (pictures_ && IsHdr(*Info().pictures))
+    if (pictures_ && IsHdr(*Info().pictures) && !choice_.keepHdr)
         texts.emplace_back("its HDR pictures were brought to the light and colours of BT.709");
+    else if (pictures_ && Info().pictures->depth > 8 && !choice_.deep)
+        texts.push_back(fmt::format("its pictures of {} bits got 8", Info().pictures->depth));
     if (const int jumps = demuxer_.ClockJumps(); jumps > 0) {
         texts.push_back(fmt::format("the source's clock jumped {}; the parts were joined",
                                     jumps == 1 ? "once" : fmt::format("{} times", jumps)));

@@ -23,6 +23,9 @@ public:
 
     const SourceInfo& Info() const { return source_.Info(); }
 
+    /// Whether its pictures are handed out as HDR.
+    bool KeepsHdr() const { return choice_.keepHdr && pictures_ && IsHdr(*Info().pictures); }
+
     /// The content of a cover or an attachment; empty for other streams. Only before the conversion.
     std::vector<uint8_t> StoredFile(int stream) const { return source_.StoredFile(stream); }
 
@@ -58,6 +61,7 @@ public:
     std::vector<std::string> Complaints() const;
 
 private:
+    const SourceChoice choice_;
     Source source_;
     Failures failures_;
     Demuxer demuxer_;

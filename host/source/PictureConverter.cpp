@@ -7,9 +7,9 @@
 namespace movieconv {
 namespace {
 
-av::Frame NewPicture(int width, int height) {
+av::Frame NewPicture(AVPixelFormat format, int width, int height) {
     av::Frame picture = av::NewFrame();
-    picture->format = AV_PIX_FMT_YUV420P;
+    picture->format = format;
     picture->width = width;
     picture->height = height;
     picture->color_range = AVCOL_RANGE_MPEG;
@@ -22,15 +22,19 @@ bool IsFullRange(const AVFrame& picture) {
     return picture.color_range == AVCOL_RANGE_JPEG || picture.format == AV_PIX_FMT_YUVJ420P;
 }
 
-/// Copies a plane so that target pixel (x, y) is source pixel `origin` + x * `stepX` + y * `stepY`.
+/// Copies a plane so that target pixel (x, y) is source pixel `origin` + x * `stepX` + y * `stepY`; the steps
+/// count samples.
+template <typename Sample>
 struct Walk {
-    const uint8_t* origin;
+    const Sample* origin;
     ptrdiff_t stepX;
     ptrdiff_t stepY;
 };
 
-Walk WalkFor(const uint8_t* plane, ptrdiff_t pitch, int width, int height, int quarterTurns, bool mirrored) {
-    Walk walk{plane, 1, pitch};
+template <typename Sample>
+Walk<Sample> WalkFor(const Sample* plane, ptrdiff_t pitch, int width, int height, int quarterTurns,
+                     bool mirrored) {
+    Walk<Sample> walk{plane, 1, pitch};
     if (mirrored) {
         walk.origin += width - 1;
         walk.stepX = -1;
@@ -43,13 +47,14 @@ Walk WalkFor(const uint8_t* plane, ptrdiff_t pitch, int width, int height, int q
     return walk;
 }
 
-void CopyPlane(const Walk& walk, uint8_t* target, ptrdiff_t pitch, int width, int height) {
+template <typename Sample>
+void CopyPlane(const Walk<Sample>& walk, Sample* target, ptrdiff_t pitch, int width, int height) {
     constexpr int kBlock = 32; // pixels; keeps the columns that a turned row crosses in the cache
     for (int top = 0; top < height; top += kBlock) {
         for (int left = 0; left < width; left += kBlock) {
             for (int y = top; y < height && y < top + kBlock; ++y) {
-                const uint8_t* source = walk.origin + walk.stepY * y + walk.stepX * left;
-                uint8_t* row = target + pitch * y;
+                const Sample* source = walk.origin + walk.stepY * y + walk.stepX * left;
+                Sample* row = target + pitch * y;
                 for (int x = left; x < width && x < left + kBlock; ++x, source += walk.stepX)
                     row[x] = *source;
             }
@@ -57,11 +62,26 @@ void CopyPlane(const Walk& walk, uint8_t* target, ptrdiff_t pitch, int width, in
     }
 }
 
+/// All planes of `picture`, mirrored and turned, into `turned`, which has the size for it.
+template <typename Sample>
+void TurnPlanes(const AVFrame& picture, AVFrame& turned, int quarterTurns, bool mirrored) {
+    constexpr int kBytes = sizeof(Sample);
+    for (int plane = 0; plane < 3; ++plane) {
+        const int shift = plane == 0 ? 0 : 1;
+        const auto part = [&](int size) { return (size + shift) >> shift; };
+        const auto walk =
+            WalkFor(reinterpret_cast<const Sample*>(picture.data[plane]), picture.linesize[plane] / kBytes,
+                    part(picture.width), part(picture.height), quarterTurns, mirrored);
+        CopyPlane(walk, reinterpret_cast<Sample*>(turned.data[plane]), turned.linesize[plane] / kBytes,
+                  part(turned.width), part(turned.height));
+    }
+}
+
 } // namespace
 
 av::Frame PictureConverter::Convert(AVFrame& picture) {
     av::Frame converted;
-    if (picture.format == AV_PIX_FMT_YUV420P && !IsFullRange(picture)) {
+    if (picture.format == format_ && !IsFullRange(picture)) {
         converted = av::NewFrame();
         av_frame_move_ref(converted.get(), &picture);
     } else {
@@ -74,9 +94,9 @@ av::Frame PictureConverter::Convert(AVFrame& picture) {
 av::Frame PictureConverter::Scale(const AVFrame& picture) {
     const auto format = static_cast<AVPixelFormat>(picture.format);
     scaler_.reset(sws_getCachedContext(scaler_.release(), picture.width, picture.height, format,
-                                       picture.width, picture.height, AV_PIX_FMT_YUV420P,
-                                       SWS_BICUBIC | SWS_ACCURATE_RND, nullptr, nullptr, nullptr));
-    av::Frame converted = NewPicture(picture.width, picture.height);
+                                       picture.width, picture.height, format_, SWS_BICUBIC | SWS_ACCURATE_RND,
+                                       nullptr, nullptr, nullptr));
+    av::Frame converted = NewPicture(format_, picture.width, picture.height);
     if (!scaler_)
         return nullptr;
     const int* coefficients = sws_getCoefficients(picture.colorspace);
@@ -91,14 +111,9 @@ av::Frame PictureConverter::Turn(const AVFrame& picture) const {
     const bool onSide = quarterTurns_ % 2 != 0;
     const int width = onSide ? picture.height : picture.width;
     const int height = onSide ? picture.width : picture.height;
-    av::Frame turned = NewPicture(width, height);
-    for (int plane = 0; plane < 3; ++plane) {
-        const int shift = plane == 0 ? 0 : 1;
-        const auto part = [&](int size) { return (size + shift) >> shift; };
-        const Walk walk = WalkFor(picture.data[plane], picture.linesize[plane], part(picture.width),
-                                  part(picture.height), quarterTurns_, mirrored_);
-        CopyPlane(walk, turned->data[plane], turned->linesize[plane], part(width), part(height));
-    }
+    av::Frame turned = NewPicture(format_, width, height);
+    const auto turn = format_ == AV_PIX_FMT_YUV420P10 ? TurnPlanes<uint16_t> : TurnPlanes<uint8_t>;
+    turn(picture, *turned, quarterTurns_, mirrored_);
     return turned;
 }
 

@@ -1,4 +1,5 @@
-// Brings decoded pictures into the one form that the engine takes: upright 8-bit planar 4:2:0, video range.
+// Brings decoded pictures into the form that the engine takes: upright planar 4:2:0, video range, of 8 bits
+// or of 10.
 #ifndef MOVIECONV_HOST_SOURCE_PICTURECONVERTER_H
 #define MOVIECONV_HOST_SOURCE_PICTURECONVERTER_H
 
@@ -9,8 +10,11 @@ namespace movieconv {
 class PictureConverter {
 public:
     /// Pictures are mirrored left to right if asked for and then turned clockwise by so many times 90
-    /// degrees.
-    PictureConverter(int quarterTurns, bool mirrored) : quarterTurns_(quarterTurns), mirrored_(mirrored) {}
+    /// degrees. `deep`: they get 10 bits.
+    PictureConverter(int quarterTurns, bool mirrored, bool deep)
+        : quarterTurns_(quarterTurns),
+          mirrored_(mirrored),
+          format_(deep ? AV_PIX_FMT_YUV420P10 : AV_PIX_FMT_YUV420P) {}
 
     /// The picture in the engine's form. One that has it already is passed on without a copy. Null when it
     /// cannot be converted, as with a damaged size.
@@ -22,6 +26,7 @@ private:
 
     const int quarterTurns_;
     const bool mirrored_;
+    const AVPixelFormat format_;
     av::Scaler scaler_;
 };
 

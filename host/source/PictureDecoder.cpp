@@ -14,7 +14,9 @@ constexpr std::size_t kHeavyPicturesAhead = 1; // each of many decoding threads 
 constexpr std::size_t kBytesAhead = 256 << 20;
 
 std::size_t Bytes(const AVFrame& frame) {
-    return static_cast<std::size_t>(frame.width) * static_cast<std::size_t>(frame.height) * 3 / 2;
+    const std::size_t sampleBytes = frame.format == AV_PIX_FMT_YUV420P10 ? 2 : 1;
+    return sampleBytes * static_cast<std::size_t>(frame.width) * static_cast<std::size_t>(frame.height) * 3 /
+           2;
 }
 
 /// Bits for a pixel of the coded stream; 0 when its rate is not told.
@@ -27,7 +29,7 @@ double BitsPerPixel(const Source& source) {
 } // namespace
 
 PictureDecoder::PictureDecoder(const Source& source, Demuxer& demuxer, Failures& failures,
-                               Deinterlace deinterlace)
+                               const SourceChoice& choice)
     : reader_(source.Reader()),
       demuxer_(demuxer),
       failures_(failures),
@@ -36,8 +38,9 @@ PictureDecoder::PictureDecoder(const Source& source, Demuxer& demuxer, Failures&
       parameters_(CopyOf(*source.PictureStream()->codecpar)),
       threads_(BitsPerPixel(source)),
       decoder_(std::make_unique<StreamDecoder>(*parameters_, timeBase_, threads_.Count())),
-      filter_(*source.Info().pictures, deinterlace),
-      converter_(source.Info().pictures->quarterTurns, source.Info().pictures->mirrored),
+      filter_(*source.Info().pictures, choice),
+      converter_(source.Info().pictures->quarterTurns, source.Info().pictures->mirrored,
+                 choice.deep && source.Info().pictures->depth > 8),
       stamps_(ToMediaTime(1 / source.Info().pictures->frameRate)),
       queue_(threads_.OnTrial() ? kPicturesAhead : kHeavyPicturesAhead, kBytesAhead,
              {L"Movie::The picture decoder waits for the conversion",
@@ -96,7 +99,8 @@ bool PictureDecoder::Advance() {
     const AVFrame& frame = *current_.frame;
     image_ = {};
     image_.nType = kMediaTypePicture;
-    image_.nFormat = kPictureFormatPlanar420;
+    image_.nFormat =
+        frame.format == AV_PIX_FMT_YUV420P10 ? kPictureFormatPlanar420Deep : kPictureFormatPlanar420;
     image_.pY = frame.data[0];
     image_.pU = frame.data[1];
     image_.pV = frame.data[2];

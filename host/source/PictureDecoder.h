@@ -28,7 +28,7 @@ class PictureDecoder final : public VideoDecoder {
 public:
     /// The first picture handed out is the one shown at the time that Seek asked for, stamped with that time;
     /// without Seek it is the movie's first, stamped with 0 if it comes later. Throws SourceError.
-    PictureDecoder(const Source& source, Demuxer& demuxer, Failures& failures, Deinterlace deinterlace);
+    PictureDecoder(const Source& source, Demuxer& demuxer, Failures& failures, const SourceChoice& choice);
     ~PictureDecoder();
 
     VideoSourceInfo* GetVideoInfo() override { return &info_; }

@@ -13,7 +13,7 @@ namespace {
 
 // Light is made linear, brought to the smaller gamut and rolled off above what SDR's white is.
 constexpr char kToneMap[] = "zscale=t=linear:npl=100,format=gbrpf32le,zscale=p=bt709,tonemap=hable:desat=0,"
-                            "zscale=t=bt709:m=bt709:r=tv,format=yuv420p";
+                            "zscale=t=bt709:m=bt709:r=tv,format=";
 
 void Check(int result) {
     av::CheckMemory(result);
@@ -39,8 +39,10 @@ void PictureFilter::GraphFree::operator()(AVFilterGraph* graph) const {
     Filters().avfilter_graph_free(&graph);
 }
 
-PictureFilter::PictureFilter(const PictureStreamInfo& pictures, Deinterlace deinterlace)
-    : deinterlace_(deinterlace), transfer_(IsHdr(pictures) ? pictures.colorTransfer : 0) {}
+PictureFilter::PictureFilter(const PictureStreamInfo& pictures, const SourceChoice& choice)
+    : deinterlace_(choice.deinterlace),
+      deep_(choice.deep && pictures.depth > 8),
+      transfer_(IsHdr(pictures) && !choice.keepHdr ? pictures.colorTransfer : 0) {}
 
 PictureFilter::~PictureFilter() = default;
 
@@ -91,7 +93,7 @@ void PictureFilter::Build(const AVFrame& picture) {
                         : deinterlace_ == Deinterlace::kFlagged ? "bwdif=mode=send_frame:deint=interlaced"
                                                                 : "";
     if (transfer_ != 0)
-        chain += (chain.empty() ? "" : ",") + std::string(kToneMap);
+        chain += (chain.empty() ? "" : ",") + std::string(kToneMap) + (deep_ ? "yuv420p10" : "yuv420p");
     AVFilterInOut* inputs = Filters().avfilter_inout_alloc();
     AVFilterInOut* outputs = Filters().avfilter_inout_alloc();
     int result = AVERROR(ENOMEM);

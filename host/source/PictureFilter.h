@@ -25,7 +25,7 @@ public:
     /// Takes a picture by moving its content out; false ends the work.
     using Sink = std::function<bool(AVFrame& picture, std::optional<int64_t> stamp)>;
 
-    PictureFilter(const PictureStreamInfo& pictures, Deinterlace deinterlace);
+    PictureFilter(const PictureStreamInfo& pictures, const SourceChoice& choice);
     ~PictureFilter();
 
     /// False when the sink wanted no more. Throws SourceError when the pictures cannot be filtered.
@@ -47,6 +47,7 @@ private:
     bool HandOut(const Sink& sink);
 
     const Deinterlace deinterlace_;
+    const bool deep_;
     const int transfer_; // of HDR that becomes SDR; 0: none does
     bool deinterlaced_ = false;
     std::unique_ptr<AVFilterGraph, GraphFree> graph_;

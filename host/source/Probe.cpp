@@ -3,6 +3,7 @@
 #include "host/source/MediaTime.h"
 #include "host/source/SourceError.h"
 #include "host/source/StreamDecoder.h"
+#include "host/source/StreamDescription.h"
 
 #include <algorithm>
 #include <cmath>
@@ -206,6 +207,38 @@ void ProbeFrameRate(MovieReader& reader, SourceInfo& info) {
         if (const double peak = av_q2d(stream->r_frame_rate); peak <= kHighestPeakRate)
             pictures.peakRate = std::max(pictures.peakRate, peak);
     }
+}
+
+void ProbeLight(MovieReader& reader, SourceInfo& info) {
+    constexpr int kMostPackets = 100; // until the first picture comes out
+    PictureStreamInfo& pictures = *info.pictures;
+    if (!IsHdr(pictures) || (pictures.masteringDisplay && pictures.lightLevel) || !reader.IsSeekable())
+        return;
+    const AVStream* stream = reader.Context()->streams[pictures.index];
+    const av::CodecParameters parameters = CopyOf(*stream->codecpar);
+    StreamDecoder decoder(*parameters, stream->time_base, 1);
+    const auto look = [&](const AVFrame& frame) {
+        const auto sideData = [&](AVFrameSideDataType type) -> const void* {
+            const AVFrameSideData* data = av_frame_get_side_data(&frame, type);
+            return data != nullptr ? data->data : nullptr;
+        };
+        TakeLight(static_cast<const AVMasteringDisplayMetadata*>(
+                      sideData(AV_FRAME_DATA_MASTERING_DISPLAY_METADATA)),
+                  static_cast<const AVContentLightMetadata*>(sideData(AV_FRAME_DATA_CONTENT_LIGHT_LEVEL)),
+                  pictures);
+        return false;
+    };
+    const av::Packet packet = av::NewPacket();
+    bool goesOn = true;
+    for (int count = 0;
+         goesOn && count < kMostPackets && av_read_frame(reader.Context(), packet.get()) >= 0;) {
+        if (packet->stream_index == pictures.index) {
+            goesOn = decoder.Decode(packet.get(), look);
+            ++count;
+        }
+        av_packet_unref(packet.get());
+    }
+    ReturnToBegin(reader, info);
 }
 
 void ProbeLength(MovieReader& reader, SourceInfo& info) {

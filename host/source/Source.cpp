@@ -53,6 +53,8 @@ Source::Source(const std::string& path, const SourceChoice& choice,
 void Source::Probe() {
     if (info_.pictures)
         ProbeFrameRate(reader_, info_);
+    if (info_.pictures)
+        ProbeLight(reader_, info_);
     ProbeLength(reader_, info_);
     if (info_.pictures)
         StreamOf(info_.pictures->index).pictures = info_.pictures;

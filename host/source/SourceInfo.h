@@ -66,8 +66,7 @@ struct PictureStreamInfo {
     bool dolbyVision = false;
 };
 
-/// Whether the pictures are made for more light and colour than usual displays have. They are handed out as
-/// BT.709.
+/// Whether the pictures are made for more light and colour than usual displays have.
 inline bool IsHdr(const PictureStreamInfo& pictures) {
     constexpr int kPerceptualQuantizer = 16;
     constexpr int kHybridLogGamma = 18;
@@ -144,6 +143,8 @@ struct SourceChoice {
     bool pictures = true; ///< Look for pictures at all.
     bool sound = true;    ///< Look for sound at all.
     Deinterlace deinterlace = Deinterlace::kFlagged;
+    bool deep = false;      ///< Pictures of more than 8 bits are handed out with 10; otherwise with 8.
+    bool keepHdr = false;   ///< HDR pictures are handed out as they are; otherwise as BT.709.
     bool playlists = false; ///< Also open what names other movies, in its own folder and below.
 };
 

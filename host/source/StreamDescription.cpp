@@ -10,7 +10,6 @@
 extern "C" {
 #include <libavutil/avstring.h>
 #include <libavutil/display.h>
-#include <libavutil/mastering_display_metadata.h>
 #include <libavutil/pixdesc.h>
 }
 
@@ -92,21 +91,9 @@ void ReadLight(const AVStream* stream, PictureStreamInfo& info) {
     const auto sideData = [&](AVPacketSideDataType type) {
         return av_stream_get_side_data(stream, type, nullptr);
     };
-    if (const auto* display = reinterpret_cast<const AVMasteringDisplayMetadata*>(
-            sideData(AV_PKT_DATA_MASTERING_DISPLAY_METADATA))) {
-        MasteringDisplay& told = info.masteringDisplay.emplace();
-        for (int axis = 0; axis < 2; ++axis) {
-            told.red[axis] = av_q2d(display->display_primaries[0][axis]);
-            told.green[axis] = av_q2d(display->display_primaries[1][axis]);
-            told.blue[axis] = av_q2d(display->display_primaries[2][axis]);
-            told.white[axis] = av_q2d(display->white_point[axis]);
-        }
-        told.darkest = av_q2d(display->min_luminance);
-        told.brightest = av_q2d(display->max_luminance);
-    }
-    if (const auto* light =
-            reinterpret_cast<const AVContentLightMetadata*>(sideData(AV_PKT_DATA_CONTENT_LIGHT_LEVEL)))
-        info.lightLevel = {static_cast<int>(light->MaxCLL), static_cast<int>(light->MaxFALL)};
+    TakeLight(
+        reinterpret_cast<const AVMasteringDisplayMetadata*>(sideData(AV_PKT_DATA_MASTERING_DISPLAY_METADATA)),
+        reinterpret_cast<const AVContentLightMetadata*>(sideData(AV_PKT_DATA_CONTENT_LIGHT_LEVEL)), info);
     info.dolbyVision = sideData(AV_PKT_DATA_DOVI_CONF) != nullptr;
 }
 
@@ -224,6 +211,23 @@ StreamInfo DescribeStream(AVFormatContext& context, AVStream* stream, int64_t st
 }
 
 } // namespace
+
+void TakeLight(const AVMasteringDisplayMetadata* display, const AVContentLightMetadata* light,
+               PictureStreamInfo& info) {
+    if (display != nullptr && display->has_primaries != 0 && display->has_luminance != 0) {
+        MasteringDisplay& told = info.masteringDisplay.emplace();
+        for (int axis = 0; axis < 2; ++axis) {
+            told.red[axis] = av_q2d(display->display_primaries[0][axis]);
+            told.green[axis] = av_q2d(display->display_primaries[1][axis]);
+            told.blue[axis] = av_q2d(display->display_primaries[2][axis]);
+            told.white[axis] = av_q2d(display->white_point[axis]);
+        }
+        told.darkest = av_q2d(display->min_luminance);
+        told.brightest = av_q2d(display->max_luminance);
+    }
+    if (light != nullptr)
+        info.lightLevel = {static_cast<int>(light->MaxCLL), static_cast<int>(light->MaxFALL)};
+}
 
 std::vector<StreamInfo> DescribeStreams(AVFormatContext& context, int64_t start) {
     std::vector<StreamInfo> streams;

@@ -7,6 +7,10 @@
 
 #include <vector>
 
+extern "C" {
+#include <libavutil/mastering_display_metadata.h>
+}
+
 namespace movieconv {
 
 /// All times count from `start`, in media time. Nothing is read; what only decoding would tell is left out.
@@ -15,6 +19,11 @@ std::vector<Chapter> DescribeChapters(const AVFormatContext& context, int64_t st
 
 /// What people wrote: nothing that a multiplexer notes about its own file.
 std::vector<Tag> DescribeTags(const AVDictionary* metadata);
+
+/// Takes down what a stream or a frame tells of the light that its pictures were made for; null where it does
+/// not.
+void TakeLight(const AVMasteringDisplayMetadata* display, const AVContentLightMetadata* light,
+               PictureStreamInfo& info);
 
 } // namespace movieconv
 

@@ -101,6 +101,13 @@ void AddPictures(CLI::App& app, Options& options) {
         {{"all", Deinterlace::kAll}, {"auto", Deinterlace::kFlagged}, {"off", Deinterlace::kNone}},
         "Make pictures progressive that say they are interlaced\n(auto, the default), all or none")
         ->group(group);
+    AddChoice<Hdr>(app, "--hdr", options.request.hdr,
+                   {{"auto", Hdr::kAuto}, {"keep", Hdr::kKeep}, {"sdr", Hdr::kSdr}},
+                   "Keep HDR, make SDR of it, or keep it where the codec\nhas 10 bits (auto, the default)")
+        ->group(group);
+    AddChoice<int>(app, "--depth", options.request.depth, {{"8", 8}, {"10", 10}},
+                   "Bits of a colour; by default the source's, as far as\nthe codec has them")
+        ->group(group);
     AddParsed(app, "--frame-rate", ParseFrameRate, options.request.frameRate,
               "a frame rate up to 200, such as 25 or 30000/1001",
               "Pictures per second; by default the source's")
