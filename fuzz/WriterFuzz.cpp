@@ -107,6 +107,7 @@ public:
         image.nHeight = height = changes ? Size(input, kMostHeight) : height;
         const int chromaWidth = width / 2 + width % 2;
         const int chromaHeight = height / 2 + height % 2;
+        sampleBytes = image.nFormat == kPictureFormatPlanar420Deep ? 2 : 1;
         MakePlane(image.pY, image.nPitchY, width, height, planes[0]);
         MakePlane(image.pU, image.nPitchU, chromaWidth, chromaHeight, planes[1]);
         MakePlane(image.pV, image.nPitchV, chromaWidth, chromaHeight, planes[2]);
@@ -116,9 +117,10 @@ public:
     }
 
 private:
-    void MakePlane(unsigned char*& plane, int32_t& pitch, int rowBytes, int rows,
+    void MakePlane(unsigned char*& plane, int32_t& pitch, int columns, int rows,
                    std::vector<unsigned char>& bytes) {
-        const bool exists = rowBytes > 0 && rows > 0 && rowBytes <= kMostWidth && rows <= kMostHeight;
+        const bool exists = columns > 0 && rows > 0 && columns <= kMostWidth && rows <= kMostHeight;
+        const int rowBytes = exists ? columns * sampleBytes : columns;
         pitch = exists ? rowBytes + input.ConsumeIntegralInRange(0, 3) : rowBytes;
         bytes.assign(exists ? static_cast<size_t>(pitch) * static_cast<size_t>(rows - 1) +
                                   static_cast<size_t>(rowBytes)
@@ -150,6 +152,7 @@ private:
     int64_t stamp;
     int width = 32;
     int height = 16;
+    int sampleBytes = 1;
     std::vector<unsigned char> planes[3];
     VideoImage image{};
 };

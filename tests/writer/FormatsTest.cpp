@@ -138,6 +138,16 @@ TEST_P(PictureFormats, TakeAQualityOfTheCodecsScale) {
     EXPECT_EQ(size(best - 1), 0);
 }
 
+TEST_P(PictureFormats, TakeTheDepthsThatTheyTell) {
+    const auto [format, codec, sound] = GetParam();
+    WriterOptions options{};
+    for (const int depth : {8, 9, 10}) {
+        options.nDepth = depth;
+        const bool told = depth != 9 && depth <= MWGetPictureDepth(codec);
+        EXPECT_EQ(SizeWith(format, codec, options) > 0, told) << depth;
+    }
+}
+
 TEST(Speed, IsTheEncodersChoiceOfTools) {
     const auto size = [](int speed, int profile) {
         WriterOptions options{};
