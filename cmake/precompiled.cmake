@@ -1,6 +1,6 @@
-# Headers that most files of a target include, parsed once for each set of flags. Only where a preset asks for it: the
-# native build does without, so that every file is known to include what it needs. So does a compiler cache, which
-# knows no such headers.
+# Headers that most files of a target include, parsed once for each set of flags: half of a build's time. Only where a
+# preset asks for it: scripts/check looks at a build without, so that every file is known to include what it needs. A
+# compiler cache does without as well, as it knows no such headers.
 option(MOVIECONV_PRECOMPILE "Precompile headers" OFF)
 
 set(standard_headers <algorithm> <array> <atomic> <cerrno> <cmath> <cstdint> <cstdio> <cstdlib> <cstring> <functional>

@@ -27,7 +27,7 @@ std::optional<int64_t> NextStamp(FuzzedDataProvider& input, int64_t due) {
 }
 
 void FuzzPictures(FuzzedDataProvider& input) {
-    const int64_t step = input.ConsumeIntegralInRange<int64_t>(1, 1 << 30);
+    const auto step = input.ConsumeIntegralInRange<int64_t>(1, 1 << 30);
     movieconv::StampRepair repair(step);
     std::optional<int64_t> last;
     int64_t given = 0;
