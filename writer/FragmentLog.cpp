@@ -6,7 +6,6 @@
 #include <algorithm>
 #include <cstring>
 #include <new>
-#include <span>
 #include <utility>
 
 namespace writer {
@@ -117,6 +116,22 @@ private:
 
 } // namespace
 
+void ReadFragment(std::span<const uint8_t> head, int64_t position,
+                  const std::function<void(const PlacedPacket&)>& take) {
+    uint32_t type = 0;
+    Bytes parts = Bytes(head).Box(type);
+    while (!parts.Empty()) {
+        Bytes part = parts.Box(type);
+        if (type != Type("traf"))
+            continue;
+        Track track(position, take);
+        while (!part.Empty()) {
+            const Bytes content = part.Box(type);
+            track.Take(type, content);
+        }
+    }
+}
+
 void FragmentLog::Take(int64_t position, const uint8_t* data, int64_t size) noexcept {
     try {
         if (box_.empty() && position > boxPosition_)
@@ -166,20 +181,8 @@ void FragmentLog::Collect(const uint8_t* data, int64_t size) {
 void FragmentLog::ForEach(const std::function<void(const PlacedPacket&)>& take) const {
     if (!whole_ || !box_.empty())
         ThrowSenseless();
-    for (const Fragment& fragment : fragments_) {
-        uint32_t type = 0;
-        Bytes parts = Bytes(fragment.head).Box(type);
-        while (!parts.Empty()) {
-            Bytes part = parts.Box(type);
-            if (type != Type("traf"))
-                continue;
-            Track track(fragment.position, take);
-            while (!part.Empty()) {
-                const Bytes content = part.Box(type);
-                track.Take(type, content);
-            }
-        }
-    }
+    for (const Fragment& fragment : fragments_)
+        ReadFragment(fragment.head, fragment.position, take);
 }
 
 } // namespace writer

@@ -5,6 +5,7 @@
 
 #include <cstdint>
 #include <functional>
+#include <span>
 #include <vector>
 
 namespace writer {
@@ -19,6 +20,11 @@ struct PlacedPacket {
     int64_t duration;
     bool key;
 };
+
+/// Calls `take` for every packet of the fragment at `position` whose head, a "moof" box, is `head`. Throws
+/// WriterFailure (kWriterErrorFinish) when that makes no sense.
+void ReadFragment(std::span<const uint8_t> head, int64_t position,
+                  const std::function<void(const PlacedPacket&)>& take);
 
 /// Keeps the head of every fragment: 4 to 12 bytes a packet, and some 150 a fragment.
 class FragmentLog {

@@ -59,9 +59,13 @@ bool ReadAll(ByteFile& file, int64_t position, uint8_t* data, int64_t size) {
     return true;
 }
 
+constexpr int64_t kBoxHeaderSize = 8;
+
 struct Box {
     std::array<char, 4> type;
     int64_t size; ///< With its header; 0 when the header is not whole or makes no sense.
+
+    bool Is(const char* name) const { return std::memcmp(type.data(), name, type.size()) == 0; }
 };
 
 int64_t Number(const uint8_t* bytes, int size) {
@@ -71,7 +75,7 @@ int64_t Number(const uint8_t* bytes, int size) {
 
 Box ReadBox(ByteFile& file, int64_t position) {
     std::array<uint8_t, 16> header{};
-    int64_t headerSize = 8;
+    int64_t headerSize = kBoxHeaderSize;
     if (!ReadAll(file, position, header.data(), headerSize))
         return {};
     Box box{{}, Number(header.data(), 4)};
@@ -83,6 +87,38 @@ Box ReadBox(ByteFile& file, int64_t position) {
         box.size = Number(&header[8], 8);
     }
     return box.size < headerSize ? Box{} : box;
+}
+
+/// Whether it is of a type that a fragmented file consists of.
+bool IsPartOfFile(const Box& box) {
+    constexpr std::array kTypes{"ftyp", "free", "moov", "moof", "mdat", "mfra"};
+    return std::any_of(kTypes.begin(), kTypes.end(), [&](const char* type) { return box.Is(type); });
+}
+
+/// Whether the fragment whose head begins at `head` has its data in `data`, the box at `dataAt`, and nothing
+/// else is there. Without memory to find out: as if it were so.
+bool HoldsAll(ByteFile& part, int64_t head, int64_t dataAt, const Box& data) {
+    if (!data.Is("mdat"))
+        return false;
+    const int64_t end = dataAt + data.size;
+    int64_t begin = end;
+    int64_t reached = dataAt;
+    int64_t sum = 0;
+    try {
+        std::vector<uint8_t> bytes(static_cast<size_t>(dataAt - head));
+        if (!ReadAll(part, head, bytes.data(), dataAt - head))
+            return false;
+        ReadFragment(bytes, head, [&](const PlacedPacket& packet) {
+            begin = std::min(begin, packet.position);
+            reached = std::max(reached, packet.position + packet.size);
+            sum += packet.size;
+        });
+    } catch (const std::bad_alloc&) {
+        return true;
+    } catch (const WriterFailure&) {
+        return false;
+    }
+    return begin == dataAt + kBoxHeaderSize && reached == end && sum == end - begin;
 }
 
 [[noreturn]] void ThrowIncomplete() {
@@ -144,16 +180,22 @@ void FinishFragments(const std::shared_ptr<ByteFile>& part, const Muxer& written
 
 int64_t WholeFragments(ByteFile& part, int64_t size) {
     int64_t whole = 0;
-    for (int64_t position = 0; position < size;) {
-        const Box box = ReadBox(part, position);
-        if (box.size == 0 || box.size > size - position)
-            break;
-        position += box.size;
-        // A fragment is a description followed by its data; the file's own description is whole by itself.
-        if (std::memcmp(box.type.data(), "moof", 4) != 0)
+    int64_t head = -1; // where that of a fragment begins whose data comes next
+    for (int64_t position = 0;;) {
+        const bool boxFollows = size - position >= kBoxHeaderSize;
+        const Box box = boxFollows ? ReadBox(part, position) : Box{};
+        // Data that is shorter than its box says ends in the midst of another one.
+        if (boxFollows && !IsPartOfFile(box))
+            return whole;
+        if (head < 0)
             whole = position;
+        if (box.size == 0 || box.size > size - position)
+            return whole;
+        if (head >= 0 && !HoldsAll(part, head, position, box))
+            return whole;
+        head = box.Is("moof") ? position : -1;
+        position += box.size;
     }
-    return whole;
 }
 
 } // namespace writer

@@ -20,8 +20,9 @@ void FinishFragments(const std::shared_ptr<ByteFile>& part, const Muxer& written
                      const FragmentLog& log, const Mp4Room& room, bool bitExact, const Extras& extras,
                      const std::function<void(double)>& progress);
 
-/// How far `part`, which has `size` bytes, consists of whole fragments. The multiplexer does not know: of
-/// data that it had no memory for it does not tell.
+/// How far `part`, which has `size` bytes, consists of whole fragments, whose data is exactly what their
+/// heads name. The multiplexer does not know: of data that it had no memory for it does not tell, and when it
+/// fails in the midst of a packet, the data of those that follow is not where the head has it.
 int64_t WholeFragments(ByteFile& part, int64_t size);
 
 } // namespace writer

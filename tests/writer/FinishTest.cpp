@@ -3,6 +3,7 @@
 #include "MovieReader.h"
 #include "tests/support/Folder.h"
 #include "writer/FragmentLog.h"
+#include "writer/Fragments.h"
 #include "writer/MediaFile.h"
 #include "writer/Mp4Index.h"
 #include "writer/Mp4Room.h"
@@ -99,22 +100,30 @@ void Apply(std::string& file, const Piece& piece) {
     file.replace(static_cast<size_t>(piece.position), piece.data.size(), piece.data);
 }
 
+uint64_t NumberAt(const std::string& file, size_t at, int bytes) {
+    uint64_t value = 0;
+    for (int i = 0; i < bytes; ++i)
+        value = value << 8 | static_cast<unsigned char>(file[at + static_cast<size_t>(i)]);
+    return value;
+}
+
+/// Where the boxes of a file begin, and where the last one ends.
+std::vector<size_t> BoxPlaces(const std::string& file) {
+    std::vector<size_t> places{0};
+    while (places.back() + 16 <= file.size()) {
+        const uint64_t size = NumberAt(file, places.back(), 4);
+        places.push_back(places.back() + (size == 1 ? NumberAt(file, places.back() + 8, 8) : size));
+    }
+    return places;
+}
+
 /// The types of the boxes of a file, in their order.
 std::string Boxes(const std::string& file) {
+    const std::vector<size_t> places = BoxPlaces(file);
     std::string types;
-    const auto number = [&file](size_t at, int bytes) {
-        uint64_t value = 0;
-        for (int i = 0; i < bytes; ++i)
-            value = value << 8 | static_cast<unsigned char>(file[at + static_cast<size_t>(i)]);
-        return value;
-    };
-    size_t at = 0;
-    while (at + 16 <= file.size()) {
-        types += file.substr(at + 4, 4) + " ";
-        const uint64_t size = number(at, 4);
-        at += size == 1 ? number(at + 8, 8) : size;
-    }
-    return at == file.size() ? types : types + "and a part";
+    for (size_t i = 0; i + 1 < places.size(); ++i)
+        types += file.substr(places[i] + 4, 4) + " ";
+    return places.back() == file.size() ? types : types + "and a part";
 }
 
 struct Layout {
@@ -214,6 +223,42 @@ TEST_P(Finish, FragmentsAreLearnedFromTheBytesOnTheirWay) {
     EXPECT_EQ(number, packets.size());
 }
 
+/// The size to which the file would be cut.
+size_t WholeSize(const std::string& file) {
+    const Folder folder;
+    int error = 0;
+    const auto made = writer::SystemFiles().Create(folder / "part", "", error);
+    const auto size = static_cast<int64_t>(file.size());
+    EXPECT_EQ(made->Write(reinterpret_cast<const uint8_t*>(file.data()), size), size);
+    return static_cast<size_t>(writer::WholeFragments(*made, size));
+}
+
+// As the multiplexer leaves them when it gets no memory for data, or fails in the midst of a packet.
+TEST_P(Finish, FragmentsAreWholeWithAllTheirDataAndNothingElse) {
+    Write();
+    const std::string& file = close_.before;
+    ASSERT_EQ(WholeSize(file), file.size());
+    const std::vector<size_t> places = BoxPlaces(file);
+    size_t box = 0;
+    for (int fragments = 0; fragments < 3; ++box)
+        fragments += file.compare(places[box] + 4, 4, "moof") == 0 ? 1 : 0;
+    const size_t head = places[box - 1];
+    const size_t data = places[box];
+    ASSERT_EQ(file.substr(data + 4, 4), "mdat");
+    constexpr size_t kBytes = 40;
+    const auto withSize = [&](std::string changed, uint64_t size) {
+        for (size_t i = 0; i < 4; ++i)
+            changed[data + i] = static_cast<char>(size >> (24 - 8 * i));
+        return changed;
+    };
+    const uint64_t size = NumberAt(file, data, 4);
+    const std::string lost = std::string(file).erase(data + 20, kBytes);
+    const std::string stray = std::string(file).insert(data + 20, kBytes, 'x');
+    for (const std::string& broken : {lost, withSize(lost, size - kBytes), withSize(stray, size + kBytes),
+                                      file.substr(0, data + 20), file.substr(0, head + 3)})
+        EXPECT_EQ(WholeSize(broken), head);
+}
+
 /// Puts two holes of 2.25 GiB in front of the first fragment of `grown`, which the log learns as it is
 /// written.
 std::unique_ptr<writer::ByteFile> WriteSparse(const std::string& path, const std::string& grown,
@@ -243,10 +288,7 @@ TEST_P(Finish, ReachesBeyondFourGigabytes) {
     const std::string path = folder_ / "sparse";
     const std::unique_ptr<writer::ByteFile> file = WriteSparse(path, grown, log);
     const size_t free = grown.find("free") - 4;
-    int64_t size = 0;
-    for (size_t i = 0; i < 4; ++i)
-        size = size << 8 | static_cast<unsigned char>(grown[free + i]);
-    writer::Mp4Room room(size);
+    writer::Mp4Room room(static_cast<int64_t>(NumberAt(grown, free, 4)));
     ASSERT_EQ(room.Close(*file), 0);
     const writer::Container& container = *writer::FindContainer(GetParam().format);
     const writer::Extras extras;
