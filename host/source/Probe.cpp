@@ -22,6 +22,8 @@ namespace {
 
 constexpr double kGuessedDuration = 3600;  // for sources that tell nothing at all, such as pipes
 constexpr int64_t kStretchBytes = 2 << 20; // read at the end, and at the beginning, to find the duration
+constexpr double kMostVariation =
+    4; // of the bit rate; more by which stamps exceed what the size tells are a jump
 constexpr double kClockStart = 8; // a stamp below, far into the file, may count on from what was probed
 constexpr double kHighestPeakRate = 240;  // likewise where pictures follow each other closest
 constexpr int kCountedPictures = 250;     // to find out how many there are in a second
@@ -29,7 +31,9 @@ constexpr double kFallbackFrameRate = 25; // pictures keep their own times whate
 
 /// What the packets of a part of the source tell, in seconds from its start.
 struct Stretch {
-    int64_t bytes = 0;
+    int64_t bytes = 0;  // of packets
+    int64_t begin = -1; // in the file
+    int64_t reached = 0;
     double first = std::numeric_limits<double>::infinity(); // stamp
     double last = 0;
     double end = 0;    // of what lasts longest
@@ -80,6 +84,10 @@ Stretch ReadStretch(MovieReader& reader, int counted, int64_t mostBytes,
            av_read_frame(context, packet.get()) >= 0) {
         const AVStream* stream = context->streams[packet->stream_index];
         stretch.bytes += packet->size;
+        if (packet->pos >= 0) {
+            stretch.begin = stretch.begin < 0 ? packet->pos : std::min(stretch.begin, packet->pos);
+            stretch.reached = std::max(stretch.reached, packet->pos + packet->size);
+        }
         if (packet->stream_index == counted) {
             ++stretch.packets;
             stretch.length += static_cast<double>(packet->duration) * av_q2d(stream->time_base);
@@ -122,21 +130,42 @@ double CountFrameRate(MovieReader& reader, const SourceInfo& info) {
                                                          : 0;
 }
 
+int Counted(const SourceInfo& info) {
+    return info.pictures ? info.pictures->index : info.sound->index;
+}
+
+/// The last part of the file; an empty one where it cannot be sought.
+Stretch ReadTail(MovieReader& reader, const SourceInfo& info) {
+    const int64_t target = std::max<int64_t>(info.bytes - kStretchBytes, 0);
+    const bool byBytes = (reader.Context()->iformat->flags & AVFMT_NO_BYTE_SEEK) == 0;
+    const int sought =
+        byBytes ? avformat_seek_file(reader.Context(), -1, INT64_MIN, target, INT64_MAX, AVSEEK_FLAG_BYTE)
+                : avformat_seek_file(reader.Context(), -1, INT64_MIN, INT64_MAX / 2, INT64_MAX, 0);
+    return sought >= 0 ? ReadStretch(reader, Counted(info), INT64_MAX) : Stretch{};
+}
+
+/// Seconds, by the file's size and by how long its first and last packets last; 0 when these do not tell.
+double EstimateDuration(MovieReader& reader, const SourceInfo& info, const Stretch& tail) {
+    const Stretch head = ReadStretch(reader, Counted(info), kStretchBytes);
+    ReturnToBegin(reader, info);
+    const auto span = [](const Stretch& part) {
+        return part.begin < 0 ? part.bytes : part.reached - part.begin;
+    };
+    const int64_t bytes = span(head) + span(tail);
+    return bytes > 0
+               ? static_cast<double>(info.bytes) * (head.length + tail.length) / static_cast<double>(bytes)
+               : 0;
+}
+
 /// Finds out by reading the end of the file how long it is, and its beginning too where the stamps are
 /// counted from wherever reading starts.
 void MeasureDuration(MovieReader& reader, SourceInfo& info) {
-    const int counted = info.pictures ? info.pictures->index : info.sound->index;
     Stretch tail;
     bool countsOn = true;
     if (reader.IsSeekable()) {
-        const int64_t target = std::max<int64_t>(info.bytes - kStretchBytes, 0);
+        tail = ReadTail(reader, info);
         const bool byBytes = (reader.Context()->iformat->flags & AVFMT_NO_BYTE_SEEK) == 0;
-        const int sought =
-            byBytes ? avformat_seek_file(reader.Context(), -1, INT64_MIN, target, INT64_MAX, AVSEEK_FLAG_BYTE)
-                    : avformat_seek_file(reader.Context(), -1, INT64_MIN, INT64_MAX / 2, INT64_MAX, 0);
-        if (sought >= 0)
-            tail = ReadStretch(reader, counted, INT64_MAX);
-        countsOn = !byBytes || target == 0 || tail.first > kClockStart;
+        countsOn = !byBytes || info.bytes <= kStretchBytes || tail.first > kClockStart;
         if (countsOn)
             ReturnToBegin(reader, info);
         else
@@ -146,15 +175,26 @@ void MeasureDuration(MovieReader& reader, SourceInfo& info) {
         info.duration = tail.end;
         return;
     }
-    if (tail.length > 0) {
-        const Stretch head = ReadStretch(reader, counted, kStretchBytes);
-        ReturnToBegin(reader, info);
-        info.duration = static_cast<double>(info.bytes) * (head.length + tail.length) /
-                        static_cast<double>(head.bytes + tail.bytes);
-    }
+    if (tail.length > 0)
+        info.duration = EstimateDuration(reader, info, tail);
     info.certainty = info.duration > 0 ? Certainty::kEstimated : Certainty::kGuessed;
     if (info.duration <= 0)
         info.duration = kGuessedDuration;
+}
+
+/// Where the clock may start anew, the last stamp says little: files that were joined seem to last for hours.
+/// True when the duration is by the size instead.
+bool DoubtStamps(MovieReader& reader, SourceInfo& info) {
+    if ((reader.Context()->iformat->flags & AVFMT_TS_DISCONT) == 0 || !reader.IsSeekable())
+        return false;
+    const Stretch tail = ReadTail(reader, info);
+    ReturnToBegin(reader, info);
+    const double estimate = tail.length > 0 ? EstimateDuration(reader, info, tail) : 0;
+    if (estimate <= 0 || info.duration < estimate * kMostVariation)
+        return false;
+    info.duration = estimate;
+    info.certainty = Certainty::kEstimated;
+    return true;
 }
 
 /// Whether a stream that is not converted may be what makes the movie as long as the container tells.
@@ -249,10 +289,12 @@ void ProbeLength(MovieReader& reader, SourceInfo& info) {
         info.duration -= ToSeconds(reader.Start());
     // ASF has its length from whoever wrote it, who may have taken the last stamp for it.
     const bool doubtful = av_match_name("asf", format.name) != 0 && reader.Start() > kTicksPerSecond;
-    const bool measured =
+    bool measured =
         info.duration <= 0 || doubtful || context.duration_estimation_method == AVFMT_DURATION_FROM_BITRATE;
     if (measured)
         MeasureDuration(reader, info);
+    else
+        measured = DoubtStamps(reader, info);
     FindPromise(reader, info, measured);
     const double whole = std::exchange(info.duration, 0);
     const auto complete = [&](double& duration, std::optional<double> promised) {
