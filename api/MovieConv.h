@@ -28,7 +28,8 @@
 /// MCAbort.
 ///
 /// Errors. A null handle does nothing and gives 0, from MCStart and MCWait -1. So does a lack of memory. No
-/// exception leaves these functions, and none may come out of a decoder or a callback.
+/// exception leaves these functions; one that comes out of a decoder or a callback ends the conversion, with
+/// its file closed, and MCGetResult tells of it.
 #ifndef MOVIECONV_API_MOVIECONV_H
 #define MOVIECONV_API_MOVIECONV_H
 

@@ -113,6 +113,13 @@ std::vector<Case> Cases() {
                      .outcome = kOutcomeStopped,
                      .pictures = 2,
                      .onProgress = [](MCHandle handle) { return static_cast<unsigned>(MCAbort(handle)); }});
+    cases.push_back({.name = "TheCallbackCallsMCStopWhichIsRefused",
+                     .category = MC_RESULT_DONE,
+                     .outcome = kOutcomeCompleted,
+                     .onProgress = [](MCHandle handle) {
+                         EXPECT_EQ(MCStop(handle), 0);
+                         return kGoOn;
+                     }});
     return cases;
 }
 
