@@ -2,6 +2,7 @@
 
 #include "media/FourCC.h"
 #include "media/MediaWriter.h"
+#include "writer/WriterStatus.h"
 
 #include <algorithm>
 #include <cctype>
@@ -63,6 +64,12 @@ std::optional<uint32_t> ParseCode(std::string_view text) {
     std::transform(text.begin(), text.end(), code,
                    [](char c) { return static_cast<char>(std::toupper(static_cast<unsigned char>(c))); });
     return FourCC(code[0], code[1], code[2], code[3]);
+}
+
+std::optional<QualityScale> QualityScaleOf(uint32_t videoCodec) {
+    QualityScale scale{};
+    return MWGetQualityScale(videoCodec, &scale.best, &scale.worst) != 0 ? std::optional(scale)
+                                                                         : std::nullopt;
 }
 
 std::string CodeName(uint32_t code) {

@@ -20,6 +20,15 @@ const FileFormatInfo* FindFormatOfFile(std::string_view path);
 /// "H264" from "h264", "AAC " from "aac". Nothing for more than four characters or none.
 std::optional<uint32_t> ParseCode(std::string_view text);
 
+/// A codec's scale of constant quality, where less is better.
+struct QualityScale {
+    double best;
+    double worst;
+};
+
+/// Nothing for codecs that have none, such as those that lose nothing.
+std::optional<QualityScale> QualityScaleOf(uint32_t videoCodec);
+
 /// The characters of a code, without the spaces at its end.
 std::string CodeName(uint32_t code);
 

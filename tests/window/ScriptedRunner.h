@@ -36,6 +36,7 @@ public:
     std::vector<movieconv::window::PresetFacts> Presets() override;
     movieconv::window::PresetFacts LoadPreset(const std::string& path) override;
     void SavePreset(const std::string& path, const movieconv::window::Wishes& wishes) override;
+    std::string PresetFolder() override { return {}; }
     std::vector<movieconv::window::FormatFacts> Formats() override;
     std::unique_ptr<movieconv::window::Run>
     Start(const movieconv::window::Order& order,

@@ -147,9 +147,12 @@ public:
     virtual std::vector<PresetFacts> Presets() = 0;
     virtual std::vector<FormatFacts> Formats() = 0;
 
-    /// These read or write a small file. Throw std::runtime_error with a sentence for people.
+    /// These read or write a small file. What was loaded is among Presets() from then on. Throw
+    /// std::runtime_error with a sentence for people.
     virtual PresetFacts LoadPreset(const std::string& path) = 0;
     virtual void SavePreset(const std::string& path, const Wishes& wishes) = 0;
+    /// Where the user's own are kept; what is there is among Presets(). May be empty.
+    virtual std::string PresetFolder() = 0;
 
     /// Returns at once; whatever goes wrong is an outcome.
     virtual std::unique_ptr<Run> Start(const Order& order, std::shared_ptr<RunListener> listener) = 0;

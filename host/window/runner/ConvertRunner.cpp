@@ -6,6 +6,7 @@
 #include "host/convert/Sources.h"
 #include "host/convert/StillPicture.h"
 #include "host/window/model/Words.h"
+#include "host/window/runner/PresetShelf.h"
 #include "host/window/runner/Translation.h"
 #include "text/Path.h"
 
@@ -139,8 +140,9 @@ private:
 
 class ConvertRun : public Run {
 public:
-    ConvertRun(const Order& order, std::shared_ptr<RunListener> listener, Worker& remover)
-        : parts_(std::make_shared<Parts>(order, std::move(listener))), remover_(remover) {}
+    ConvertRun(const Order& order, const Request& request, std::shared_ptr<RunListener> listener,
+               Worker& remover)
+        : parts_(std::make_shared<Parts>(order, request, std::move(listener))), remover_(remover) {}
     ~ConvertRun() override {
         remover_.Do(0, [parts = std::move(parts_)]() mutable { parts.reset(); });
     }
@@ -149,10 +151,14 @@ public:
         try {
             parts_->job.Start();
         } catch (const std::system_error& error) {
-            Verdict verdict;
-            verdict.failure.emplace(Category::kInternal, error.what());
-            parts_->interpreter.Ended(verdict);
+            Fail(Category::kInternal, error.what());
         }
+    }
+    /// Instead of beginning.
+    void Fail(Category category, const std::string& text) {
+        Verdict verdict;
+        verdict.failure.emplace(category, text);
+        parts_->interpreter.Ended(verdict);
     }
     void Pause() override { parts_->job.Pause(); }
     void Resume() override { parts_->job.Resume(); }
@@ -166,8 +172,8 @@ public:
 
 private:
     struct Parts {
-        Parts(const Order& order, std::shared_ptr<RunListener> listener)
-            : interpreter(std::move(listener), order.facts.leftBehind), job(ToRequest(order), interpreter) {}
+        Parts(const Order& order, const Request& request, std::shared_ptr<RunListener> listener)
+            : interpreter(std::move(listener), order.facts.leftBehind), job(request, interpreter) {}
         Interpreter interpreter;
         Job job;
     };
@@ -203,11 +209,14 @@ QStringList LeftBehind(const SourceInfo& info) {
 } // namespace
 
 Abilities ConvertRunner::Can() {
-    return {};
+    Abilities abilities;
+    abilities.deinterlace = true;
+    abilities.presetFiles = true;
+    return abilities;
 }
 
 std::vector<PresetFacts> ConvertRunner::Presets() {
-    return BuiltInPresets();
+    return PresetsOnShelf();
 }
 
 std::vector<FormatFacts> ConvertRunner::Formats() {
@@ -220,18 +229,32 @@ std::vector<FormatFacts> ConvertRunner::Formats() {
     return formats;
 }
 
-PresetFacts ConvertRunner::LoadPreset(const std::string&) {
-    throw std::runtime_error("presets");
+PresetFacts ConvertRunner::LoadPreset(const std::string& path) {
+    try {
+        return TakeIntoShelf(path);
+    } catch (const PresetError& error) {
+        throw std::runtime_error(Sentence(error.what()).toStdString());
+    }
 }
 
-void ConvertRunner::SavePreset(const std::string&, const Wishes&) {
-    throw std::runtime_error("presets");
+void ConvertRunner::SavePreset(const std::string& path, const Wishes& wishes) {
+    WritePreset(path, wishes);
+}
+
+std::string ConvertRunner::PresetFolder() {
+    return OwnPresetFolder();
 }
 
 std::unique_ptr<Run> ConvertRunner::Start(const Order& order, std::shared_ptr<RunListener> listener) {
-    auto run = std::make_unique<ConvertRun>(order, std::move(listener), remover_);
-    run->Begin();
-    return run;
+    try {
+        auto run = std::make_unique<ConvertRun>(order, ToRequest(order), listener, remover_);
+        run->Begin();
+        return run;
+    } catch (const PresetError& error) {
+        auto run = std::make_unique<ConvertRun>(order, Request(), std::move(listener), remover_);
+        run->Fail(Category::kRequest, error.what());
+        return run;
+    }
 }
 
 MovieFacts ConvertRunner::Look(const std::string& path) {
@@ -284,11 +307,14 @@ Findings ConvertRunner::Check(const Order& order) {
         findings.warnings += Texts::tr("There is no folder “%1”.").arg(Readable(folder));
         return findings;
     }
-    const Request request = ToRequest(order);
-    const double seconds = request.length.value_or(order.facts.seconds - request.begin);
-    findings.needed = static_cast<int64_t>(
-        seconds * ((request.noVideo ? 0 : request.videoRate.value_or(0)) + request.audioRate.value_or(0)) /
-        8);
+    try {
+        const Request request = ToRequest(order);
+        const double seconds = request.length.value_or(order.facts.seconds - request.begin);
+        findings.needed = static_cast<int64_t>(seconds * EstimatedRate(order, request) / 8);
+    } catch (const PresetError& error) {
+        findings.warnings += Sentence(error.what());
+        return findings;
+    }
     if (const int64_t free = FreeBytes(folder); free >= 0) {
         findings.free = free;
         if (free < *findings.needed) {

@@ -7,11 +7,11 @@
 
 namespace movieconv::window {
 
-/// The presets there are. Their texts are in the user's language.
-std::vector<PresetFacts> BuiltInPresets();
-
-/// What is wanted of a movie, in the library's terms.
+/// What is wanted of a movie, in the library's terms. Throws PresetError when there is no such preset.
 Request ToRequest(const Order& order);
+
+/// Bits a second that the order's target takes, about: where a constant quality decides, by experience.
+double EstimatedRate(const Order& order, const Request& request);
 
 } // namespace movieconv::window
 

@@ -124,6 +124,54 @@
         <source>Leaves the pictures out (AAC).</source>
         <translation>Lässt die Bilder weg (AAC).</translation>
     </message>
+    <message>
+        <source>Best</source>
+        <translation>Beste</translation>
+    </message>
+    <message>
+        <source>No difference to be seen, in large files (H.264, AAC).</source>
+        <translation>Kein Unterschied zu sehen, in großen Dateien (H.264, AAC).</translation>
+    </message>
+    <message>
+        <source>AV1</source>
+        <translation>AV1</translation>
+    </message>
+    <message>
+        <source>The smallest files, for new players (AV1, Opus).</source>
+        <translation>Die kleinsten Dateien, für neue Abspieler (AV1, Opus).</translation>
+    </message>
+    <message>
+        <source>Archive</source>
+        <translation>Archiv</translation>
+    </message>
+    <message>
+        <source>Without any loss, in very large files (FFV1, FLAC).</source>
+        <translation>Ohne jeden Verlust, in sehr großen Dateien (FFV1, FLAC).</translation>
+    </message>
+    <message>
+        <source>Classic</source>
+        <translation>Klassisch</translation>
+    </message>
+    <message>
+        <source>As the program converted in its first version (MPEG-4, AAC).</source>
+        <translation>Wie das Programm in seiner ersten Version umgewandelt hat (MPEG-4, AAC).</translation>
+    </message>
+    <message>
+        <source>The preset cannot be saved: %1.</source>
+        <translation>Die Vorlage kann nicht gespeichert werden: %1.</translation>
+    </message>
+    <message>
+        <source>There is no folder for presets of your own.</source>
+        <translation>Es gibt keinen Ordner für eigene Vorlagen.</translation>
+    </message>
+    <message>
+        <source>You have a preset “%1” already.</source>
+        <translation>Es gibt schon eine eigene Vorlage „%1“.</translation>
+    </message>
+    <message>
+        <source>Made of “%1”.</source>
+        <translation>Aus „%1“ gemacht.</translation>
+    </message>
 </context>
 <context>
     <name>Words</name>
@@ -446,11 +494,11 @@
         <translation>Wird angesehen …</translation>
     </message>
     <message>
-        <source>The preset's (.%1)</source>
+        <source>The preset&apos;s (.%1)</source>
         <translation>Das der Vorlage (.%1)</translation>
     </message>
     <message>
-        <source>The preset's</source>
+        <source>The preset&apos;s</source>
         <translation>Das der Vorlage</translation>
     </message>
     <message>

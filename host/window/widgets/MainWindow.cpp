@@ -11,6 +11,7 @@
 
 #include <QAction>
 #include <QCloseEvent>
+#include <QDir>
 #include <QFileDialog>
 #include <QLabel>
 #include <QMimeData>
@@ -184,10 +185,14 @@ void MainWindow::SavePreset(const Wishes& wishes) {
     dialog->setAttribute(Qt::WA_DeleteOnClose);
     dialog->setAcceptMode(QFileDialog::AcceptSave);
     dialog->setDefaultSuffix(QStringLiteral("json"));
+    const QString folder = QString::fromStdString(runner_.PresetFolder());
+    if (!folder.isEmpty() && QDir().mkpath(folder))
+        dialog->setDirectory(folder);
     connect(dialog, &QFileDialog::fileSelected, this, [this, wishes](const QString& path) {
         try {
             runner_.SavePreset(path.toStdString(), wishes);
             entryPage_->FillPresets();
+            queue_.FillPresets();
             ShowEntry();
         } catch (const std::runtime_error& error) {
             Tell(QString::fromUtf8(error.what()));

@@ -1,0 +1,164 @@
+// What the window's runner makes of presets and wishes.
+#include "host/convert/Formats.h"
+#include "host/window/runner/PresetShelf.h"
+#include "host/window/runner/Translation.h"
+#include "tests/support/Folder.h"
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <cstdlib>
+
+using namespace movieconv::window;
+
+namespace {
+
+/// With a folder for presets of its own.
+struct RunnerTest : testing::Test {
+    Folder folder;
+
+    RunnerTest() { setenv("XDG_CONFIG_HOME", folder.Path().c_str(), 1); }
+    ~RunnerTest() override { unsetenv("XDG_CONFIG_HOME"); }
+
+    std::string Own(const std::string& name) const {
+        return movieconv::OwnPresetFolder() + "/" + name + ".json";
+    }
+    static Order OrderOf(const Wishes& wishes, const std::string& target) {
+        Order order{"in.mkv", target, wishes, false, {}};
+        order.facts.width = 1920;
+        order.facts.height = 1080;
+        order.facts.rate = 25;
+        return order;
+    }
+    static PresetFacts OnShelf(const QString& name) {
+        for (const PresetFacts& facts : PresetsOnShelf())
+            if (facts.name == name)
+                return facts;
+        ADD_FAILURE() << "no preset " << name.toStdString();
+        return {};
+    }
+};
+
+constexpr char kMine[] = R"({"description": "Mine", "parent": "small", "format": "mkv", "unknown": 1})";
+
+} // namespace
+
+TEST_F(RunnerTest, OffersThePresetsOfTheProgramAndOnesOwn) {
+    std::filesystem::create_directories(movieconv::OwnPresetFolder());
+    WriteFile(Own("mine"), kMine);
+    WriteFile(Own("broken"), "{");
+    WriteFile(
+        Own("web"),
+        R"({"description": "Instead of the program's", "format": "webm", "video": {"codec": "VP80", "rate": "1M"}})");
+    QStringList names;
+    for (const PresetFacts& facts : PresetsOnShelf()) {
+        names += facts.name;
+        EXPECT_FALSE(facts.title.isEmpty() || facts.description.isEmpty() || facts.extension.isEmpty())
+            << facts.name.toStdString();
+    }
+    EXPECT_EQ(names, QStringList({"standard", "small", "best", "av1", "phone", "archive", "sound", "classic",
+                                  "mine", "web"}));
+    EXPECT_EQ(OnShelf("mine").description, "Mine");
+    EXPECT_EQ(OnShelf("mine").extension, "mkv");
+    EXPECT_EQ(OnShelf("sound").extension, "m4a");
+    EXPECT_EQ(OnShelf("web").description, "Instead of the program's");
+    for (const char* without : {"sound", "archive", "web", "classic"})
+        EXPECT_EQ(OnShelf(without).quality, -1) << without;
+    EXPECT_LT(OnShelf("small").quality, OnShelf("standard").quality);
+    EXPECT_LT(OnShelf("standard").quality, OnShelf("best").quality);
+}
+
+// The place where the slider stands at first changes nothing; to the left of it is worse, to the right
+// better.
+TEST_F(RunnerTest, MovesThePresetsOwnQuality) {
+    for (const char* name : {"standard", "small", "best", "av1", "phone"}) {
+        SCOPED_TRACE(name);
+        const movieconv::Preset preset = movieconv::LoadPreset(name);
+        const int usual = OnShelf(name).quality;
+        for (const auto& [codec, steps] : preset.preferences.quality) {
+            for (const int height : {480, 720, 1080, 2160}) {
+                const double own = *steps.At(height);
+                EXPECT_EQ(QualityOf(preset, codec, height, usual), own);
+                EXPECT_GT(QualityOf(preset, codec, height, 0), own);
+                EXPECT_LE(QualityOf(preset, codec, height, 100), own);
+                const auto scale = movieconv::QualityScaleOf(codec);
+                EXPECT_LE(*QualityOf(preset, codec, height, 0), scale->worst);
+                EXPECT_GE(*QualityOf(preset, codec, height, 100), scale->best);
+            }
+        }
+    }
+}
+
+TEST_F(RunnerTest, AsksTheLibraryForWhatIsWished) {
+    Wishes wishes;
+    movieconv::Request request = ToRequest(OrderOf(wishes, "out.mp4"));
+    EXPECT_FALSE(request.quality || request.size || request.videoCodec || request.frameRate);
+    EXPECT_FALSE(request.preferences.quality.empty());
+    EXPECT_EQ(request.deinterlace, movieconv::Deinterlace::kFlagged);
+    const double usual = EstimatedRate(OrderOf(wishes, "out.mp4"), request);
+
+    wishes.quality = 10;
+    wishes.height = 360;
+    wishes.deinterlace = Wishes::Deinterlace::kOff;
+    wishes.begin = 5;
+    wishes.end = 7;
+    request = ToRequest(OrderOf(wishes, "out.webm"));
+    ASSERT_TRUE(request.quality && request.size);
+    EXPECT_GT(*request.quality, 28) << "VP9's, of which the preset has 28 for so few lines";
+    EXPECT_EQ(request.size->width, 640);
+    EXPECT_EQ(request.size->height, 360);
+    EXPECT_EQ(request.deinterlace, movieconv::Deinterlace::kNone);
+    EXPECT_EQ(request.length, 2);
+    EXPECT_LT(EstimatedRate(OrderOf(wishes, "out.webm"), request), usual);
+
+    EXPECT_TRUE(ToRequest(OrderOf({}, "out.mp3")).noVideo);
+    Wishes lost;
+    lost.preset = "there is none";
+    EXPECT_THROW(ToRequest(OrderOf(lost, "out.mp4")), movieconv::PresetError);
+}
+
+TEST_F(RunnerTest, SavesWishesAsAPresetAndTakesThemBack) {
+    Wishes wishes;
+    wishes.format = "mkv";
+    wishes.quality = 80;
+    wishes.height = 720;
+    wishes.rate = 24;
+    wishes.channels = 1;
+    wishes.begin = 30; // of one movie alone
+    WritePreset(Own("mine"), wishes);
+    EXPECT_EQ(OnShelf("mine").extension, "mkv");
+    EXPECT_NEAR(OnShelf("mine").quality, 80, 3);
+    const movieconv::Preset mine = movieconv::LoadPreset("mine");
+    EXPECT_TRUE(mine.complaints.empty()) << mine.complaints.front();
+    EXPECT_EQ(mine.preferences.fitWithin->height, 720);
+    EXPECT_EQ(mine.preferences.frameRate, 24);
+    EXPECT_EQ(mine.preferences.channels, 1);
+    EXPECT_TRUE(mine.preferences.speed) << "the parent's";
+
+    Wishes changed; // and saved under the name of the preset that it changes
+    changed.preset = "mine";
+    changed.withSound = false;
+    WritePreset(Own("mine"), changed);
+    EXPECT_TRUE(movieconv::LoadPreset("mine").preferences.noAudio);
+    EXPECT_EQ(movieconv::LoadPreset("mine").preferences.frameRate, 24);
+
+    EXPECT_THROW(WritePreset("/proc/none/x.json", wishes), movieconv::PresetError);
+}
+
+TEST_F(RunnerTest, TakesAPresetFromElsewhere) {
+    std::filesystem::create_directory(folder / "sticks");
+    WriteFile(folder / "sticks/mine.json", kMine);
+    EXPECT_EQ(TakeIntoShelf(folder / "sticks/mine.json").name, "mine");
+    std::filesystem::remove_all(folder / "sticks");
+    EXPECT_EQ(OnShelf("mine").description, "Mine");
+    EXPECT_FALSE(movieconv::LoadPreset("mine").preferences.quality.empty());
+    EXPECT_EQ(TakeIntoShelf(Own("mine")).name, "mine");
+
+    std::filesystem::create_directory(folder / "sticks");
+    WriteFile(folder / "sticks/mine.json", R"({"description": "another"})");
+    EXPECT_THROW(TakeIntoShelf(folder / "sticks/mine.json"), movieconv::PresetError);
+    EXPECT_EQ(OnShelf("mine").description, "Mine") << "nothing is replaced unasked";
+    WriteFile(folder / "sticks/words.json", "words");
+    EXPECT_THROW(TakeIntoShelf(folder / "sticks/words.json"), movieconv::PresetError);
+    EXPECT_FALSE(std::filesystem::exists(Own("words")));
+}
