@@ -4,6 +4,7 @@
 #include <array>
 #include <cstring>
 #include <optional>
+#include <utility>
 
 namespace writer {
 namespace {
@@ -51,6 +52,36 @@ bool SetTag(Tags& tags, const char* key, const char* value) {
         tags.erase(key);
     else
         tags[key] = value;
+    return true;
+}
+
+TrackLabel* FindLabel(Extras& extras, int track) {
+    if (track == kWriterTrackPictures)
+        return &extras.pictures;
+    if (track == kWriterTrackSound)
+        return &extras.sound;
+    const int further = track - kWriterTrackFurther;
+    return further >= 0 && further < static_cast<int>(extras.tracks.size())
+               ? &extras.tracks[static_cast<size_t>(further)].label
+               : nullptr;
+}
+
+bool AddTrack(Extras& extras, const WriterTrack* track) {
+    if (track == nullptr || track->nSize < sizeof *track || track->pfnNext == nullptr)
+        return false;
+    const bool isSound = track->nSampleRate > 0 && track->nChannels > 0 && track->nBitsPerSample > 0;
+    if (isSound == (track->pParameters != nullptr))
+        return false;
+    Track made{{}, track->nSampleRate, track->nChannels, track->nBitsPerSample, track->nBitrate,
+               {}, track->pfnNext,     track->pContext};
+    if (!isSound) {
+        made.parameters =
+            std::shared_ptr<AVCodecParameters>(avcodec_parameters_alloc(), av::CodecParametersFree());
+        if (!made.parameters)
+            throw std::bad_alloc();
+        av::CheckMemory(avcodec_parameters_copy(made.parameters.get(), track->pParameters));
+    }
+    extras.tracks.push_back(std::move(made));
     return true;
 }
 

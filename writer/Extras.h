@@ -2,15 +2,14 @@
 #ifndef MOVIECONV_WRITER_EXTRAS_H
 #define MOVIECONV_WRITER_EXTRAS_H
 
+#include "ffmpeg/AvHandles.h"
+#include "writer/WriterStatus.h"
+
 #include <cstdint>
 #include <map>
 #include <memory>
 #include <string>
 #include <vector>
-
-extern "C" {
-#include <libavcodec/codec_id.h>
-}
 
 namespace writer {
 
@@ -36,11 +35,30 @@ struct Attachment {
     Bytes data;
 };
 
+/// What is said about a stream.
+struct TrackLabel {
+    Tags tags;
+    int flags = 0; ///< FFmpeg's AV_DISPOSITION_...
+};
+
+/// A track beside the engine's; see WriterTrack.
+struct Track {
+    TrackLabel label;
+    int sampleRate = 0; ///< Of sound to encode; 0: there are packets.
+    int channels = 0;
+    int bitsPerSample = 0;
+    int64_t bitrate = 0;
+    std::shared_ptr<AVCodecParameters> parameters; ///< Of packets.
+    WriterTrackReader next = nullptr;
+    void* context = nullptr;
+};
+
 /// Of one set. Copies share the large data.
 struct Extras {
     Tags tags;
-    Tags pictureTags;
-    Tags soundTags;
+    TrackLabel pictures;
+    TrackLabel sound;
+    std::vector<Track> tracks;
     std::vector<Chapter> chapters; ///< In the source's time, or in the file's.
     Cover cover;
     std::vector<Attachment> attachments;
@@ -48,6 +66,12 @@ struct Extras {
 
 /// Sets, or takes away where there is no value. False for an empty key.
 bool SetTag(Tags& tags, const char* key, const char* value);
+
+/// The label of a track by its number; null when there is none.
+TrackLabel* FindLabel(Extras& extras, int track);
+
+/// Adds what the caller's record describes. False when that makes no sense. Throws std::bad_alloc.
+bool AddTrack(Extras& extras, const WriterTrack* track);
 
 /// A cover with its codec and size; without a codec when it is neither JPEG nor PNG.
 Cover MakeCover(const void* data, int64_t size);

@@ -172,6 +172,27 @@ SoundPlan MakeSoundPlan(const EncodeParam& param, const AudioFormat& source, con
     return plan;
 }
 
+/// What the container carries of the tracks beside the engine's. Sound is encoded as the engine's is.
+std::vector<TrackPlan> MakeTrackPlans(const EncodeParam& param, const FilePlan& file, const Extras& extras) {
+    std::vector<TrackPlan> plans;
+    const Container& container = *file.container;
+    for (const Track& track : extras.tracks) {
+        if (track.sampleRate > 0 && file.sound && (container.carries & kWriterFormatTracks) != 0) {
+            EncodeParam own = param;
+            own.nSampleRate = track.sampleRate;
+            own.nChannels = track.channels;
+            own.nBitsPerSample = track.bitsPerSample;
+            if (track.bitrate > 0)
+                own.nAudioBitrate = static_cast<int32_t>(track.bitrate);
+            plans.push_back({&track, MakeSoundPlan(own, {}, container)});
+        } else if (track.parameters &&
+                   CarriesPackets(container, avcodec_get_name(track.parameters->codec_id))) {
+            plans.push_back({&track, std::nullopt});
+        }
+    }
+    return plans;
+}
+
 /// Bytes that the index of a plain file of the MP4 family takes when the movie is as long as its source; too
 /// few when it gets longer.
 int64_t IndexSize(const FilePlan& plan, const VideoFormat* video, const AudioFormat* audio,
@@ -181,6 +202,7 @@ int64_t IndexSize(const FilePlan& plan, const VideoFormat* video, const AudioFor
     constexpr double kPerUnevenPicture = 22;  // and lengths of their own
     constexpr double kPerPacket = 5;          // of sound
     constexpr double kPerSecond = 60;         // chunks of both, key pictures
+    constexpr double kPerCue = 30;            // of subtitles, and one a second is many
     constexpr double kSamplesPerPacket = 960; // the least of the usual ones
     constexpr double kUnknown = 60;           // seconds
     constexpr double kMost = 1e9;
@@ -196,6 +218,10 @@ int64_t IndexSize(const FilePlan& plan, const VideoFormat* video, const AudioFor
         length = std::max(length, double{audio->dDuration});
         perSecond += kPerPacket * plan.sound->settings.sampleRate / kSamplesPerPacket;
     }
+    for (const TrackPlan& track : plan.tracks)
+        perSecond += track.sound
+                         ? kPerPacket * track.sound->settings.sampleRate / kSamplesPerPacket + kPerSecond / 2
+                         : kPerCue;
     if (fileLength > 0 && (length <= 0 || fileLength < length))
         length = fileLength;
     const double size = (length > 0 ? length : kUnknown) * perSecond;
@@ -205,7 +231,7 @@ int64_t IndexSize(const FilePlan& plan, const VideoFormat* video, const AudioFor
 } // namespace
 
 FilePlan MakeFilePlan(const EncodeParam& param, const VideoFormat* video, const AudioFormat* audio,
-                      const WriterOptions& options) {
+                      const WriterOptions& options, const Extras& extras) {
     FilePlan plan{};
     plan.container = FindContainer(param.fccFileFormat);
     if (plan.container == nullptr)
@@ -217,6 +243,7 @@ FilePlan MakeFilePlan(const EncodeParam& param, const VideoFormat* video, const 
     if (!plan.pictures && !plan.sound)
         throw WriterFailure(kWriterErrorArgument,
                             "There is nothing to write into a file of the format " + FormatText(param) + ".");
+    plan.tracks = MakeTrackPlans(param, plan, extras);
     plan.bitExact = options.bBitExact != 0;
     plan.indexSize = IndexSize(plan, video, audio, options.dFileLength);
     return plan;

@@ -5,6 +5,7 @@
 
 #include "media/EncodeParam.h"
 #include "media/MediaRecords.h"
+#include "writer/Extras.h"
 #include "writer/FormatTable.h"
 #include "writer/PictureEncoder.h"
 #include "writer/PicturePacer.h"
@@ -14,6 +15,7 @@
 
 #include <cstdint>
 #include <optional>
+#include <vector>
 
 namespace writer {
 
@@ -37,10 +39,17 @@ struct SoundPlan {
     bool neverEmpty;
 };
 
+/// A track beside the engine's.
+struct TrackPlan {
+    const Track* track;
+    std::optional<SoundPlan> sound; ///< Of one that is encoded.
+};
+
 struct FilePlan {
     const Container* container;
     std::optional<PicturePlan> pictures;
     std::optional<SoundPlan> sound;
+    std::vector<TrackPlan> tracks; ///< Those that the container carries.
     bool bitExact;
     /// Bytes that the index of a file of the MP4 family takes when it is as long as its source.
     int64_t indexSize;
@@ -50,9 +59,9 @@ struct FilePlan {
 };
 
 /// Throws WriterFailure when the parameters make no sense or do not fit together. `video` and `audio` may be
-/// null: the file then goes without.
+/// null: the file then goes without. `extras` outlive the plan.
 FilePlan MakeFilePlan(const EncodeParam& param, const VideoFormat* video, const AudioFormat* audio,
-                      const WriterOptions& options);
+                      const WriterOptions& options, const Extras& extras);
 
 } // namespace writer
 

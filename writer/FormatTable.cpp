@@ -86,40 +86,41 @@ constexpr uint32_t kTags = kWriterFormatTags;
 constexpr uint32_t kChapters = kWriterFormatChapters;
 constexpr uint32_t kCover = kWriterFormatCover;
 constexpr uint32_t kFiles = kWriterFormatAttachments;
+constexpr uint32_t kTracks = kWriterFormatTracks;
 constexpr const char* kClusters = "cluster_time_limit=1000"; // what is lost at most when a file is cut off
 constexpr std::array kContainers{
     Container{FourCC("MP4 "), "MP4 (MPEG-4 Part 14)", "mp4,m4v", "mp4", kFragmented, nullptr,
-              kTags | kChapters | kCover, false,
+              kTags | kChapters | kCover | kTracks, nullptr, false,
               {kXvid, kH264, kHevc, kMjpg, kVp9, kMpeg2, kAv1}, {kAac, kMp3, kAc3, kOpus, kVorbis}},
     Container{FourCC("MOV "), "QuickTime", "mov,qt", "mov", kFragmented, nullptr,
-              kTags | kChapters, false,
+              kTags | kChapters | kTracks, nullptr, false,
               {kXvid, kH264, kHevc, kMjpg, kMpeg2}, {kAac, kMp3, kAc3, kAlac, kPcm}},
     Container{FourCC("MKV "), "Matroska", "mkv", "matroska", kStreamed, kClusters,
-              kTags | kChapters | kCover | kFiles, false,
+              kTags | kChapters | kCover | kFiles | kTracks, nullptr, false,
               {kXvid, kH264, kHevc, kMjpg, kVp8, kVp9, kMpeg2, kFlv1, kAv1, kFfv1},
               {kAac, kMp3, kAc3, kFlac, kOpus, kVorbis, kAlac, kMp2, kPcm}},
     Container{FourCC("AVI "), "AVI (Audio Video Interleaved)", "avi,divx", "avi", kSteadyRate, nullptr,
-              kTags, false,
+              kTags | kTracks, nullptr, false,
               {kXvid, kH264, kMjpg, kVp8, kMpeg2, kFlv1}, {kMp3, kAac, kAc3, kPcm}},
     Container{FourCC("WEBM"), "WebM", "webm", "webm", kStreamed, kClusters,
-              kTags | kChapters, false, {kVp8, kVp9, kAv1}, {kVorbis, kOpus}},
+              kTags | kChapters | kTracks, nullptr, false, {kVp8, kVp9, kAv1}, {kVorbis, kOpus}},
     Container{FourCC("FLV "), "Flash Video", "flv", "flv", kStreamed, nullptr,
-              kTags, false, {kH264, kFlv1}, {kAac, kMp3}},
+              kTags, nullptr, false, {kH264, kFlv1}, {kAac, kMp3}},
     Container{FourCC("TS  "), "MPEG transport stream", "ts,m2ts,mts", "mpegts", kStreamed, nullptr,
-              kTags, false,
+              kTags | kTracks, nullptr, false,
               {kH264, kHevc, kXvid, kMpeg2}, {kAac, kMp3, kAc3, kOpus, kMp2}},
     Container{FourCC("MPG "), "MPEG program stream", "mpg,mpeg,vob", "vob", kStreamed, nullptr,
-              0, false, {kMpeg2}, {kMp2, kAc3}},
+              0, nullptr, false, {kMpeg2}, {kMp2, kAc3}},
     Container{FourCC("M4A "), "MPEG-4 audio", "m4a,m4b", "ipod", kFragmented, nullptr,
-              kTags | kChapters | kCover, false, {}, {kAac, kAc3, kAlac}},
+              kTags | kChapters | kCover | kTracks, nullptr, false, {}, {kAac, kAc3, kAlac}},
     Container{FourCC("MP3 "), "MP3", "mp3", "mp3", kStreamed, nullptr,
-              kTags | kCover, false, {}, {kMp3}},
+              kTags | kCover, nullptr, false, {}, {kMp3}},
     Container{FourCC("WAV "), "WAV (RIFF wave)", "wav", "wav", kSteadyRate, "rf64=auto",
-              kTags, false, {}, {kPcm, kMp3, kAc3}},
+              kTags, nullptr, false, {}, {kPcm, kMp3, kAc3}},
     Container{FourCC("FLAC"), "FLAC", "flac", "flac", kStreamed, nullptr,
-              kTags | kCover, false, {}, {kFlac}},
+              kTags | kCover, nullptr, false, {}, {kFlac}},
     Container{FourCC("OGG "), "Ogg", "ogg,oga,opus", "ogg", kStreamed, nullptr,
-              kTags, true, {}, {kVorbis, kOpus, kFlac}},
+              kTags, nullptr, true, {}, {kVorbis, kOpus, kFlac}},
 };
 
 constexpr std::array kFlashRates{44100, 22050, 11025, 0};
@@ -244,6 +245,10 @@ const AVCodec* FindEncoder(const SoundCodec& codec, int bitsPerSample) {
     default:
         return avcodec_find_encoder(AV_CODEC_ID_PCM_S16LE);
     }
+}
+
+bool CarriesPackets(const Container& /*container*/, const char* /*codec*/) {
+    return false;
 }
 
 const Carriage& FindCarriage(const Container& container, uint32_t codec) {

@@ -85,8 +85,10 @@ struct Container {
     const char* extensions;
     const char* muxer;
     ContainerKind kind;
-    const char* options;            ///< The multiplexer's own, as "name=value,...".
-    uint32_t carries;               ///< kWriterFormat... of what goes in beside pictures and sound.
+    const char* options; ///< The multiplexer's own, as "name=value,...".
+    uint32_t carries;    ///< kWriterFormat... of what goes in beside pictures and sound.
+    /// FFmpeg's names of the codecs for subtitles that fit, that for any text first; null for none.
+    const char* subtitles;
     bool tagsInStream;              ///< Texts about the movie belong to its stream.
     std::array<uint32_t, 12> video; ///< Codes of the codecs that fit, the default first, then zeros.
     std::array<uint32_t, 12> audio;
@@ -109,6 +111,9 @@ bool TakesDeep(const PictureCodec& codec);
 /// This FFmpeg build's encoder; null when it has none. `bitsPerSample` chooses among those for PCM.
 const AVCodec* FindEncoder(const PictureCodec& codec);
 const AVCodec* FindEncoder(const SoundCodec& codec, int bitsPerSample);
+
+/// Whether packets of the codec with that name of FFmpeg's can be carried, or subtitles in it as others.
+bool CarriesPackets(const Container& container, const char* codec);
 
 /// How the container carries the codec.
 const Carriage& FindCarriage(const Container& container, uint32_t codec);

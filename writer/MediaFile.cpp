@@ -45,12 +45,12 @@ EncoderFlags FlagsFor(const FilePlan& plan) {
 }
 
 int AddEncoder(Muxer& muxer, const AVCodecContext& context, AVRational unit, AVRational rate, int64_t runUp,
-               const Carriage& carriage, const HdrLight* light = nullptr) {
+               const Carriage& carriage, const TrackLabel& label, const HdrLight* light = nullptr) {
     const av::CodecParameters parameters(avcodec_parameters_alloc());
     if (!parameters || avcodec_parameters_from_context(parameters.get(), &context) < 0)
         throw std::bad_alloc();
     return muxer.AddStream(
-        {parameters.get(), unit, rate, context.sample_aspect_ratio, runUp, &carriage, light});
+        {parameters.get(), unit, rate, context.sample_aspect_ratio, runUp, &carriage, &label, light});
 }
 
 /// Where the file's data really goes. Throws WriterFailure when nothing may be written there.
@@ -68,7 +68,7 @@ std::string UsableTarget(const std::string& target, const WriterOptions& options
 
 MediaFile::MediaFile(const std::string& target, const EncodeParam& param, const VideoFormat* video,
                      const AudioFormat* audio, std::shared_ptr<FileRecord> record, FileSystem& files)
-    : plan_(MakeFilePlan(param, video, audio, record->Options())),
+    : plan_(MakeFilePlan(param, video, audio, record->Options(), *record->ExtraParts())),
       target_(UsableTarget(target, record->Options())),
       claim_(target_),
       record_(std::move(record)),
@@ -95,19 +95,21 @@ void MediaFile::OpenStages() {
         pictures_ = std::make_unique<PictureStage>(*plan_.pictures, flags);
         const AVCodecContext& encoder = pictures_->Encoder();
         const PictureClock& clock = plan_.pictures->clock;
-        pictureStream_ =
-            AddEncoder(part_.Streams(), encoder, clock.tick, clock.rate,
-                       int64_t{encoder.has_b_frames} * clock.ticksPerPicture,
-                       FindCarriage(*plan_.container, plan_.pictures->codec->code),
-                       plan_.pictures->settings.light ? &*plan_.pictures->settings.light : nullptr);
+        pictureStream_ = AddEncoder(
+            part_.Streams(), encoder, clock.tick, clock.rate,
+            int64_t{encoder.has_b_frames} * clock.ticksPerPicture,
+            FindCarriage(*plan_.container, plan_.pictures->codec->code), record_->ExtraParts()->pictures,
+            plan_.pictures->settings.light ? &*plan_.pictures->settings.light : nullptr);
     }
     if (plan_.sound) {
         sound_ = std::make_unique<SoundStage>(*plan_.sound, flags);
         const AVCodecContext& encoder = sound_->Encoder();
-        soundStream_ =
-            AddEncoder(part_.Streams(), encoder, {1, encoder.sample_rate}, {0, 1}, encoder.initial_padding,
-                       FindCarriage(*plan_.container, plan_.sound->codec->code));
+        soundStream_ = AddEncoder(
+            part_.Streams(), encoder, {1, encoder.sample_rate}, {0, 1}, encoder.initial_padding,
+            FindCarriage(*plan_.container, plan_.sound->codec->code), record_->ExtraParts()->sound);
     }
+    for (const TrackPlan& track : plan_.tracks)
+        beside_.Add(track, *plan_.container, flags, part_.Streams());
     record_->Update([&](WriterStatus& status) {
         if (pictures_) {
             status.nWidth = pictures_->Encoder().width;
@@ -154,6 +156,8 @@ bool MediaFile::WriteVideo(const VideoImage& image) {
     });
     try {
         StartSoundIfKnown();
+        StartBeside();
+        beside_.Reach(time + SourceBegin());
         return pictures_->Push(image, time);
     } catch (...) {
         Fail(std::current_exception());
@@ -185,6 +189,10 @@ bool MediaFile::AddSound(const AudioFrame& frame, const PcmFormat& format) {
         status.llSamplesReceived += frame.nLength / format.BytesPerFrame();
         status.dAudioReceived = static_cast<double>(stamps_.SoundLength()) / kTicksPerSecond;
     });
+    if (!pictures_ && stamps_.SoundStart()) {
+        StartBeside();
+        beside_.Reach(EndInSource());
+    }
     if (waiting_.empty() || !(waiting_.back().format == format))
         waiting_.push_back({format, {}});
     std::vector<uint8_t>& data = waiting_.back().data;
@@ -193,6 +201,29 @@ bool MediaFile::AddSound(const AudioFrame& frame, const PcmFormat& format) {
     const bool longEnough = waiting_.size() > 1 || static_cast<int64_t>(data.size()) >=
                                                        format.BytesPerSecond() / kStretchesPerSecond;
     return !soundStarted_ || !longEnough || PushSound();
+}
+
+/// Once it is known where the file begins in the source.
+void MediaFile::StartBeside() {
+    if (beside_.Empty() || beside_.Started())
+        return;
+    beside_.Start(
+        SourceBegin(), [this](AVPacket& packet, int stream) { part_.Write(packet, stream); },
+        [this](const std::exception_ptr& error) { Fail(error); });
+}
+
+/// The source's time at time 0 of the file; the source's time is the file's where the host tells none.
+int64_t MediaFile::SourceBegin() const {
+    const int64_t start = firstPicture_ ? *firstPicture_ : stamps_.SoundStart().value_or(0);
+    return sourceBegin_ ? *sourceBegin_ - start : 0;
+}
+
+/// Where the file ends in the source as it stands: with its sound, or without any with its pictures.
+int64_t MediaFile::EndInSource() const {
+    if (sound_ && stamps_.SoundLength() > 0)
+        return SourceBegin() + stamps_.SoundStart().value_or(0) + stamps_.SoundLength();
+    const double pictures = record_->Snapshot().dVideoReceived;
+    return SourceBegin() + firstPicture_.value_or(0) + std::llround(pictures * kTicksPerSecond);
 }
 
 void MediaFile::StartSoundIfKnown() {
@@ -228,6 +259,7 @@ void MediaFile::CancelStages() {
         pictures_->Cancel();
     if (sound_)
         sound_->Cancel();
+    beside_.Cancel();
 }
 
 bool MediaFile::Close() {
@@ -269,12 +301,10 @@ int MediaFile::Conclude() {
 Extras MediaFile::FinalExtras() const {
     Extras extras = *record_->ExtraParts();
     const WriterStatus status = record_->Snapshot();
-    const int64_t start = firstPicture_ ? *firstPicture_ : stamps_.SoundStart().value_or(0);
-    const int64_t shift = sourceBegin_ ? *sourceBegin_ - start : 0;
     const double end =
         std::max(static_cast<double>(firstPicture_.value_or(0)) / kTicksPerSecond + status.dVideoReceived,
                  status.dAudioReceived);
-    extras.chapters = ChaptersWithin(extras.chapters, shift, std::llround(end * kTicksPerSecond));
+    extras.chapters = ChaptersWithin(extras.chapters, SourceBegin(), std::llround(end * kTicksPerSecond));
     return extras;
 }
 
@@ -310,10 +340,12 @@ void MediaFile::DrainStages() {
         pictures_->Finish();
     if (sound_)
         sound_->Finish();
+    beside_.Finish(EndInSource());
     if (pictures_)
         pictures_->Join();
     if (sound_)
         sound_->Join();
+    beside_.Join();
 }
 
 } // namespace writer

@@ -4,6 +4,7 @@
 //     WriteVideo ─ copy ─ 1 picture ──> PictureStage ─┐
 //                                                     ├─> Muxer (one lock) ─> NAME.part ─ Close ─> NAME
 //     WriteAudio ─ copy ─ 1 s of sound ─> SoundStage ─┘
+//     how far it is ────────────────────> BesideStage: further tracks, likewise
 //
 // The data goes to a temporary file beside the target that can be played up to wherever it ends. Closing
 // encodes what is left, gives files of the MP4 family one index (a copy without encoding), syncs, and
@@ -14,6 +15,7 @@
 
 #include "media/EncodeParam.h"
 #include "media/MediaRecords.h"
+#include "writer/BesideStage.h"
 #include "writer/FilePlan.h"
 #include "writer/FileRecord.h"
 #include "writer/FileSystem.h"
@@ -64,6 +66,9 @@ private:
     void DrainStages();
     int Conclude();
     bool Empty() const;
+    void StartBeside();
+    int64_t SourceBegin() const;
+    int64_t EndInSource() const;
     Extras FinalExtras() const;
     void CheckRefusals();
 
@@ -86,6 +91,7 @@ private:
         sourceBegin_; ///< Where the first picture, or the sound alone, stood in the source.
     std::unique_ptr<PictureStage> pictures_;
     std::unique_ptr<SoundStage> sound_;
+    BesideStage beside_;
 };
 
 } // namespace writer

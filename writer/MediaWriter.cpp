@@ -175,9 +175,30 @@ int MWSetTag(uint32_t set, const char* key, const char* value) {
     return ChangeExtras(set, [&](Extras& extras) { return writer::SetTag(extras.tags, key, value); });
 }
 
-int MWSetTrackTag(uint32_t set, int forSound, const char* key, const char* value) {
+int MWSetTrackTag(uint32_t set, int track, const char* key, const char* value) {
     return ChangeExtras(set, [&](Extras& extras) {
-        return writer::SetTag(forSound != 0 ? extras.soundTags : extras.pictureTags, key, value);
+        writer::TrackLabel* label = writer::FindLabel(extras, track);
+        return label != nullptr && writer::SetTag(label->tags, key, value);
+    });
+}
+
+int MWSetTrackFlags(uint32_t set, int track, int flags) {
+    return ChangeExtras(set, [&](Extras& extras) {
+        writer::TrackLabel* label = writer::FindLabel(extras, track);
+        if (label != nullptr)
+            label->flags = flags;
+        return label != nullptr;
+    });
+}
+
+int MWAddTrack(uint32_t set, const WriterTrack* track) {
+    return ChangeExtras(set, [&](Extras& extras) { return writer::AddTrack(extras, track); });
+}
+
+int MWCarriesPackets(uint32_t format, const char* codec) {
+    return Guarded(0, [&] {
+        const writer::Container* container = writer::FindContainer(format);
+        return container != nullptr && codec != nullptr && writer::CarriesPackets(*container, codec) ? 1 : 0;
     });
 }
 

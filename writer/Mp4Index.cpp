@@ -96,7 +96,10 @@ int64_t Mp4Index::MostOf(const Extras& extras) {
     constexpr int64_t kChapterTrack = 2048;
     // In the texts, in the list, and in the tables of their track.
     int64_t size = 3 * MostTexts(extras) + (extras.chapters.empty() ? 0 : kChapterTrack);
-    for (const Tags* tags : {&extras.tags, &extras.pictureTags, &extras.soundTags})
+    std::vector<const Tags*> all{&extras.tags, &extras.pictures.tags, &extras.sound.tags};
+    for (const Track& track : extras.tracks)
+        all.push_back(&track.label.tags);
+    for (const Tags* tags : all)
         for (const auto& [key, value] : *tags)
             size += kPerTag + static_cast<int64_t>(key.size() + value.size());
     return size + (extras.cover.data ? kPerTag + static_cast<int64_t>(extras.cover.data->size()) : 0);

@@ -88,18 +88,19 @@ int Muxer::AddStream(const MuxedStream& stream) {
         throw std::bad_alloc();
     Check(avcodec_parameters_copy(made->codecpar, stream.parameters), "does not take a stream");
     if (Carries(kWriterFormatTags)) {
-        const bool isSound = stream.parameters->codec_type == AVMEDIA_TYPE_AUDIO;
-        SetTags(made->metadata, isSound ? extras_.soundTags : extras_.pictureTags);
+        SetTags(made->metadata, stream.label->tags);
         if (container_.tagsInStream)
             SetTags(made->metadata, extras_.tags);
     }
+    made->disposition = stream.label->flags;
     made->codecpar->codec_tag = stream.carriage->tag;
     made->time_base = stream.unit;
     made->avg_frame_rate = stream.rate;
     made->sample_aspect_ratio = stream.sampleAspect;
     if (stream.light != nullptr)
         AddLight(*made, *stream.light);
-    streams_.push_back({stream.unit, stream.runUp, stream.carriage, stream.light});
+    const bool sparse = stream.parameters->codec_type == AVMEDIA_TYPE_SUBTITLE;
+    streams_.push_back({stream.unit, stream.runUp, stream.carriage, stream.label, stream.light, sparse});
     return made->index;
 }
 
@@ -266,12 +267,29 @@ void Muxer::WriteAt(AVPacket& packet, int64_t position) {
 
 /// What begins before the first packet of the file is refused by some.
 int64_t Muxer::MostApart(int packetSize) {
-    const bool allBegun =
-        std::all_of(streams_.begin(), streams_.end(), [](const State& each) { return each.begun; });
+    const bool allBegun = std::all_of(streams_.begin(), streams_.end(),
+                                      [](const State& each) { return each.begun || each.sparse; });
     if (allBegun)
-        return kMostApart;
+        return LeastLag();
     bytesAtFirst_ += packetSize;
     return bytesAtFirst_ > kMostBytesAtFirst ? kMostApart : kMostApartAtFirst;
+}
+
+/// How far the one stream is ahead of the others that may still have to come before it: what is older can be
+/// written, whatever the streams that are silent for long may bring.
+int64_t Muxer::LeastLag() const {
+    if (std::none_of(streams_.begin(), streams_.end(), [](const State& each) { return each.sparse; }))
+        return kMostApart;
+    std::vector<int64_t> times;
+    for (size_t i = 0; i < streams_.size(); ++i)
+        if (!streams_[i].sparse && streams_[i].lastDts != AV_NOPTS_VALUE)
+            times.push_back(
+                av_rescale_q(streams_[i].lastDts, output_->streams[i]->time_base, av_get_time_base_q()));
+    int64_t lag = 1; // at 0 the multiplexer would wait for ever
+    for (const int64_t time : times)
+        if (const int64_t behind = *std::max_element(times.begin(), times.end()) - time; behind < kMostApart)
+            lag = std::max(lag, behind);
+    return lag;
 }
 
 /// Between two packets the multiplexers have written nothing by halves: what they hold back is not in the
@@ -322,7 +340,7 @@ Muxer::Written Muxer::Stream(int stream) const {
     const int64_t length = state.endPts - state.firstPts - out->codecpar->initial_padding;
     const int64_t runUp = av_rescale_q(state.runUp, state.unit, out->time_base);
     return {{out->codecpar, out->time_base, out->avg_frame_rate, out->sample_aspect_ratio, runUp,
-             state.carriage, state.light},
+             state.carriage, state.label, state.light},
             state.delay,
             state.packets,
             static_cast<double>(std::max<int64_t>(0, length)) * av_q2d(state.unit)};

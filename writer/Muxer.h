@@ -24,6 +24,7 @@ struct MuxedStream {
     AVRational sampleAspect;             ///< Shape of the pixels; 0/1 for sound.
     int64_t runUp;                       ///< How far below 0 times can begin, in the unit.
     const Carriage* carriage;            ///< How the container carries its codec.
+    const TrackLabel* label;             ///< What is said about it; lives as long as the muxer.
     const HdrLight* light = nullptr;     ///< Of HDR pictures, which lives as long as the muxer; may be null.
 };
 
@@ -86,8 +87,10 @@ private:
         AVRational unit{0, 1};
         int64_t runUp = 0;
         const Carriage* carriage = nullptr;
+        const TrackLabel* label = nullptr;
         const HdrLight* light = nullptr;
-        int64_t delay = 0; ///< In the file's unit.
+        bool sparse = false; ///< May be silent for long: nothing waits for it.
+        int64_t delay = 0;   ///< In the file's unit.
         int64_t lastDts = AV_NOPTS_VALUE;
         int64_t packets = 0;
         bool begun = false;
@@ -106,6 +109,7 @@ private:
     void WriteCover();
     void SetDelays();
     int64_t MostApart(int packetSize);
+    int64_t LeastLag() const;
     void NoteWhole();
     void FlushNowAndThen(int64_t time);
 

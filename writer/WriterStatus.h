@@ -181,10 +181,11 @@ typedef struct WriterOptions {
 enum {
     /// The file has one picture rate and knows no other times: what comes faster is left out.
     kWriterFormatSteadyRate = 1,
-    kWriterFormatTags = 2,        ///< Carries texts about the movie, as many as the format knows.
-    kWriterFormatChapters = 4,    ///< Carries chapters.
-    kWriterFormatCover = 8,       ///< Carries a cover picture.
-    kWriterFormatAttachments = 16 ///< Carries attached files, such as fonts.
+    kWriterFormatTags = 2,         ///< Carries texts about the movie, as many as the format knows.
+    kWriterFormatChapters = 4,     ///< Carries chapters.
+    kWriterFormatCover = 8,        ///< Carries a cover picture.
+    kWriterFormatAttachments = 16, ///< Carries attached files, such as fonts.
+    kWriterFormatTracks = 32       ///< Carries several tracks of sound.
 };
 
 /// kWriterFormat... of the format with that code, together; 0 for one that is not in the table.
@@ -226,8 +227,56 @@ enum { kWriterSourceTimeTag = 0x4D495453 };
 /// "creation_time" (ISO 8601), or as the format has it. Null or an empty value takes the text away.
 int MWSetTag(uint32_t set, const char* key, const char* value);
 
-/// The same about its pictures (`forSound` 0) or its sound, such as "language" (ISO 639-2) or "title".
-int MWSetTrackTag(uint32_t set, int forSound, const char* key, const char* value);
+/// Numbers of tracks: the engine's pictures, its sound, and from there on those that are added.
+enum { kWriterTrackPictures = 0, kWriterTrackSound = 1, kWriterTrackFurther = 2 };
+
+/// The same about a track, such as "language" (ISO 639-2) or "title".
+int MWSetTrackTag(uint32_t set, int track, const char* key, const char* value);
+
+/// What a track is for: FFmpeg's AV_DISPOSITION_..., together.
+int MWSetTrackFlags(uint32_t set, int track, int flags);
+
+struct AVCodecParameters;
+struct AVPacket;
+struct AudioFrame;
+
+/// A block of sound or a packet of a track.
+typedef struct WriterTrackItem {
+    const struct AudioFrame* pSound; ///< PCM, or null.
+    const struct AVPacket* pPacket;  ///< FFmpeg's, whose own times are not looked at; or null.
+    int64_t llTime;                  ///< 100 ns units from the start of the source.
+    int64_t llDuration;              ///< 100 ns units; 0 for a packet that lasts up to the next one.
+} WriterTrackItem;
+
+/// Asks the host for the next item of a track, which begins before `until` in the source. 0 when there is
+/// none at hand: it is asked again when the file has come further. For `closing` the file ends there, and the
+/// host waits for its source until it is sure; it may know better than `until` where that end is. Items come
+/// in their order, sound without gaps, and stay valid until the next call. Called on one thread of the
+/// writer's at a time, for one file after the other.
+typedef int (*WriterTrackReader)(void* context, int64_t until, int closing, WriterTrackItem* item);
+
+/// A track beside the engine's pictures and sound. Its source is asked, as the file grows, for what belongs
+/// to the part that has been written.
+typedef struct WriterTrack {
+    uint32_t nSize MW_SIZE_OF(WriterTrack); ///< Size of this record in bytes.
+    /// Sound to encode with the codec of EncodeParam, as it is to be in the file: samples per second,
+    /// channels, bits a sample, bits per second. 0 for packets, which have parameters instead.
+    int32_t nSampleRate;
+    int32_t nChannels;                           ///< Likewise.
+    int32_t nBitsPerSample;                      ///< Likewise.
+    int32_t nBitrate;                            ///< Likewise; 0 or less: as in EncodeParam.
+    const struct AVCodecParameters* pParameters; ///< FFmpeg's, of the version that the writer uses; or null.
+    WriterTrackReader pfnNext;
+    void* pContext; ///< Its first argument. Both have to last until the last file of the set is closed.
+} WriterTrack;
+
+/// Adds a track. Its number is the next one from kWriterTrackFurther on. Formats without kWriterFormatTracks
+/// leave out sound, formats that do not carry the codec (MWCarriesPackets) packets.
+int MWAddTrack(uint32_t set, const WriterTrack* track);
+
+/// 1 when files of the format carry packets of the codec with that name of FFmpeg's as a track: as they are,
+/// or subtitles of text as other ones. Else 0.
+int MWCarriesPackets(uint32_t format, const char* codec);
 
 /// A chapter, in the source's time (100 ns units). Each file gets what lies in it, on its own timeline, when
 /// it is closed. `title` may be null.

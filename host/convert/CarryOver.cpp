@@ -1,10 +1,14 @@
 #include "host/convert/CarryOver.h"
 
+#include "host/convert/CodecPlan.h"
 #include "media/MediaRecords.h"
 #include "writer/WriterStatus.h"
 
+#include <algorithm>
 #include <cmath>
+#include <cstddef>
 #include <fmt/format.h>
+#include <new>
 #include <string>
 #include <string_view>
 #include <utility>
@@ -18,16 +22,92 @@ int64_t Ticks(double seconds) {
     return std::llround(seconds * kTicksPerSecond);
 }
 
+int Dispositions(const StreamFlags& flags) {
+    return (flags.isDefault ? AV_DISPOSITION_DEFAULT : 0) | (flags.forced ? AV_DISPOSITION_FORCED : 0) |
+           (flags.original ? AV_DISPOSITION_ORIGINAL : 0) | (flags.dub ? AV_DISPOSITION_DUB : 0) |
+           (flags.commentary ? AV_DISPOSITION_COMMENT : 0) |
+           (flags.hearingImpaired ? AV_DISPOSITION_HEARING_IMPAIRED : 0) |
+           (flags.visualImpaired ? AV_DISPOSITION_VISUAL_IMPAIRED : 0);
+}
+
+void LabelTrack(const StreamInfo& stream, uint32_t set, int track) {
+    MWSetTrackTag(set, track, "language", stream.language.c_str());
+    MWSetTrackTag(set, track, "title", stream.title.c_str());
+    MWSetTrackFlags(set, track, Dispositions(stream.flags));
+}
+
+const StreamInfo& StreamAt(const SourceInfo& source, int index) {
+    return source.streams[static_cast<std::size_t>(index)];
+}
+
 void CarryTexts(const SourceInfo& source, uint32_t set) {
     for (const Tag& tag : source.tags)
         MWSetTag(set, tag.key.c_str(), tag.value.c_str());
-    for (const StreamInfo& stream : source.streams) {
-        const bool isSound = source.sound && stream.index == source.sound->index;
-        if (!isSound && (!source.pictures || stream.index != source.pictures->index))
-            continue;
-        MWSetTrackTag(set, isSound ? 1 : 0, "language", stream.language.c_str());
-        MWSetTrackTag(set, isSound ? 1 : 0, "title", stream.title.c_str());
+    if (source.pictures)
+        LabelTrack(StreamAt(source, source.pictures->index), set, kWriterTrackPictures);
+    if (source.sound)
+        LabelTrack(StreamAt(source, source.sound->index), set, kWriterTrackSound);
+}
+
+int TakeNext(void* context, int64_t until, int closing, WriterTrackItem* item) {
+    BesideTrack::Item found;
+    if (!static_cast<BesideTrack*>(context)->Next(until, closing != 0, found))
+        return 0;
+    *item = {found.sound, found.packet, found.time, found.duration};
+    return 1;
+}
+
+/// Adds the tracks that are read beside what the engine converts.
+class FurtherTracks {
+public:
+    FurtherTracks(Movie& movie, const Request& request, const FileFormatInfo& format, uint32_t set)
+        : movie_(movie), request_(request), format_(format), set_(set) {
+        movie.SetBounds(request.begin, request.length.has_value(), request.split.has_value());
     }
+
+    void AddSound(const StreamInfo& stream) {
+        const SoundPlan plan = PlanSound(request_, format_, *stream.sound);
+        WriterTrack track{};
+        track.nSampleRate = plan.sampleRate.value_or(stream.sound->sampleRate);
+        track.nChannels = plan.channels.value_or(stream.sound->channels);
+        track.nBitsPerSample = stream.sound->bitsPerSample;
+        track.nBitrate = plan.rate.value_or(0);
+        Add(track, movie_.ReadSoundBeside(stream.index), stream);
+    }
+
+private:
+    void Add(WriterTrack& track, BesideTrack& source, const StreamInfo& stream) {
+        track.pfnNext = TakeNext;
+        track.pContext = &source;
+        if (MWAddTrack(set_, &track) == 0)
+            throw std::bad_alloc();
+        LabelTrack(stream, set_, kWriterTrackFurther + count_++);
+    }
+
+    Movie& movie_;
+    const Request& request_;
+    const FileFormatInfo& format_;
+    const uint32_t set_;
+    int count_ = 0;
+};
+
+bool BelongTogether(const StreamInfo& one, const StreamInfo& other) {
+    return one.programs.empty() || std::any_of(one.programs.begin(), one.programs.end(), [&](int program) {
+               return std::count(other.programs.begin(), other.programs.end(), program) > 0;
+           });
+}
+
+/// Why a stream of sound beside the engine's stays behind; empty when it does not.
+std::string WhySoundStays(const SourceInfo& source, const StreamInfo& stream, const FileFormatInfo& format) {
+    if (format.bHasAudio == 0)
+        return fmt::format("{} cannot hold it", format.szName);
+    if ((MWGetFormatTraits(format.fccFormat) & kWriterFormatTracks) == 0)
+        return fmt::format("{} holds one track of sound, MKV and MP4 hold several", format.szName);
+    if (!stream.decodable || !stream.sound || stream.sound->sampleRate <= 0 || stream.sound->channels <= 0)
+        return "it cannot be decoded";
+    if (source.pictures && !BelongTogether(StreamAt(source, source.pictures->index), stream))
+        return "it belongs to another programme";
+    return {};
 }
 
 /// How many chapters were left out, because they make no sense.
@@ -49,6 +129,10 @@ bool CarryFile(const Movie& movie, const StreamInfo& stream, uint32_t set) {
 
 std::string_view KindName(StreamKind kind) {
     switch (kind) {
+    case StreamKind::kPictures:
+        return "pictures";
+    case StreamKind::kSound:
+        return "sound";
     case StreamKind::kSubtitles:
         return "subtitles";
     case StreamKind::kCover:
@@ -66,8 +150,13 @@ std::string ReasonFor(const Movie& movie, const StreamInfo& stream, const FileFo
     const uint32_t traits = MWGetFormatTraits(format.fccFormat);
     switch (stream.kind) {
     case StreamKind::kPictures:
+        if (!movie.Info().pictures || movie.Info().pictures->index == stream.index)
+            return {};
+        return "one stream of pictures is converted";
     case StreamKind::kSound:
-        return {};
+        if (!movie.Info().sound || movie.Info().sound->index == stream.index)
+            return {};
+        return WhySoundStays(movie.Info(), stream, format);
     case StreamKind::kSubtitles:
         return "subtitles are not converted";
     case StreamKind::kData:
@@ -91,7 +180,17 @@ std::string ReasonFor(const Movie& movie, const StreamInfo& stream, const FileFo
 
 } // namespace
 
-std::vector<NotCarried> CarryOver(const Movie& movie, const FileFormatInfo& format, uint32_t writerSet) {
+std::vector<int> FurtherSound(const SourceInfo& source, const FileFormatInfo& format) {
+    std::vector<int> further;
+    for (const StreamInfo& stream : source.streams)
+        if (source.sound && stream.kind == StreamKind::kSound && stream.index != source.sound->index &&
+            WhySoundStays(source, stream, format).empty())
+            further.push_back(stream.index);
+    return further;
+}
+
+std::vector<NotCarried> CarryOver(Movie& movie, const Request& request, const FileFormatInfo& format,
+                                  uint32_t writerSet) {
     const SourceInfo& source = movie.Info();
     std::vector<NotCarried> left;
     CarryTexts(source, writerSet);
@@ -105,6 +204,9 @@ std::vector<NotCarried> CarryOver(const Movie& movie, const FileFormatInfo& form
             left.push_back(
                 {"chapters", std::nullopt, {}, {}, fmt::format("{} of them have no length", wrong)});
     }
+    FurtherTracks tracks(movie, request, format, writerSet);
+    for (const int stream : FurtherSound(source, format))
+        tracks.AddSound(StreamAt(source, stream));
     bool hasCover = false;
     for (const StreamInfo& stream : source.streams) {
         std::string reason = ReasonFor(movie, stream, format, writerSet, hasCover);

@@ -3,6 +3,7 @@
 #define MOVIECONV_HOST_CONVERT_CARRYOVER_H
 
 #include "host/convert/Observer.h"
+#include "host/convert/Request.h"
 #include "host/source/Movie.h"
 #include "media/EncodeParam.h"
 
@@ -11,9 +12,13 @@
 
 namespace movieconv {
 
-/// Gives the writer's set what the format can carry of the movie: texts, chapters, cover, attachments.
-/// Returns what stays behind.
-std::vector<NotCarried> CarryOver(const Movie& movie, const FileFormatInfo& format, uint32_t writerSet);
+/// The streams of sound that go into the output beside the one that the engine converts.
+std::vector<int> FurtherSound(const SourceInfo& source, const FileFormatInfo& format);
+
+/// Gives the writer's set what the format can carry of the movie: texts, chapters, cover, attachments,
+/// further tracks, which are read from the movie while it is converted. Returns what stays behind.
+std::vector<NotCarried> CarryOver(Movie& movie, const Request& request, const FileFormatInfo& format,
+                                  uint32_t writerSet);
 
 } // namespace movieconv
 

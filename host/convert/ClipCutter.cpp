@@ -33,6 +33,7 @@ bool ClipCutter::Next() {
     end_ = begin_ + ((base_ - begin_) / *clipLength_ + 1) * *clipLength_;
     first_ = false;
     picturesDone_ = false;
+    movie_.EndFileAt(BesideBounds::kOpen);
     return true;
 }
 
@@ -115,10 +116,12 @@ VideoImage* ClipCutter::CutPictures::GetCurrentImage() {
 
 int ClipCutter::CutPictures::DecodeNext(int mode) {
     const std::optional<int64_t> next = owner_.movie_.TimeOfNextPicture();
-    if (next && *next >= owner_.end_) // it stays where it is until Next
+    if (next && *next >= owner_.end_) { // it stays where it is until Next
         owner_.picturesDone_ = true;
-    else if (owner_.movie_.Pictures()->DecodeNext(mode) < 1)
+        owner_.movie_.EndFileAt(*next);
+    } else if (owner_.movie_.Pictures()->DecodeNext(mode) < 1) {
         owner_.picturesDone_ = true;
+    }
     return owner_.picturesDone_ ? 0 : 1;
 }
 

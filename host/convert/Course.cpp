@@ -60,7 +60,7 @@ Course::Course(const Request& request, Movie& movie, Wishes& wishes, Observer& o
 Verdict Course::Run() {
     const bool lengthKnown = movie_.Info().certainty != Certainty::kGuessed;
     observer_.Started({request_.input, request_.output, length_, lengthKnown});
-    for (const NotCarried& left : CarryOver(movie_, ChooseFormat(request_), watch_.OptionSet()))
+    for (const NotCarried& left : CarryOver(movie_, request_, ChooseFormat(request_), watch_.OptionSet()))
         observer_.LeftBehind(left);
     if (request_.maxSize)
         observer_.Warned({Warning::Kind::kChosen, TellSize(request_)});

@@ -1,6 +1,7 @@
 #include "host/convert/SizePlan.h"
 
 #include "host/convert/Amounts.h"
+#include "host/convert/CarryOver.h"
 #include "host/convert/CodecPlan.h"
 #include "host/convert/EncodePlan.h"
 #include "host/convert/Failure.h"
@@ -95,13 +96,13 @@ Request FitIntoSize(Request request, const SourceInfo& source) {
     if (pictures && IsAmong(ChooseVideoCodec(request, format).value_or(0), {FourCC("FFV1")}))
         throw Failure(Category::kRequest, "a codec without loss cannot keep below a size");
     const bool packets = IsAmong(format.fccFormat, {FourCC("TS  "), FourCC("MPG ")});
+    const auto tracks = static_cast<double>(1 + FurtherSound(source, format).size());
     const double packetRate = (pictures ? source.pictures->peakRate : 0) +
-                              (sound ? source.sound->sampleRate / kSamplesPerPacket : 0);
+                              (sound ? tracks * source.sound->sampleRate / kSamplesPerPacket : 0);
     const double free = static_cast<double>(*request.maxSize) * 8 * (packets ? kPacketStreamShare : kShare) -
                         kHeadBits - packetRate * length * kPacketBits;
-    const double soundRate = sound ? FitSound(request, format, *source.sound,
-                                              free / length * (pictures ? kMostSoundShare : 1 / kSoundSpread))
-                                   : 0;
+    const double share = free / length * (pictures ? kMostSoundShare : 1 / kSoundSpread) / tracks;
+    const double soundRate = sound ? tracks * FitSound(request, format, *source.sound, share) : 0;
     const double pictureRate = (free - soundRate * length) / (length + kBufferSeconds);
     if (pictureRate < (pictures ? kLeastPictureRate : 0)) {
         throw Failure(

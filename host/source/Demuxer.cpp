@@ -29,6 +29,12 @@ Demuxer::Demuxer(Source& source, Failures& failures) : source_(source), failures
         queues_[sound->index].mayBeSilent = source.Info().pictures.has_value();
 }
 
+void Demuxer::ReadBeside(const std::vector<int>& streams) {
+    source_.Reader().SelectBeside(streams);
+    for (const int stream : streams)
+        queues_[stream].beside = true;
+}
+
 Demuxer::~Demuxer() {
     Stop();
     if (thread_.joinable())
@@ -131,12 +137,44 @@ std::variant<av::Packet, int64_t> Demuxer::TakeOrSilence(int stream) {
 std::optional<int64_t> Demuxer::Silence(const Queue& queue) const {
     if (!queue.mayBeSilent || !queue.packets.empty() || Held() < kMostBytes)
         return std::nullopt;
-    int64_t reached = INT64_MIN + kLatest;
-    for (const auto& [stream, other] : queues_)
-        reached = std::max(reached, other.end.value_or(reached));
-    const int64_t silentUntil = reached - kLatest;
+    const int64_t silentUntil = Reached() - kLatest;
     const bool isNews = silentUntil > std::max(queue.silentUntil, queue.end.value_or(INT64_MIN));
     return isNews ? std::optional(silentUntil) : std::nullopt;
+}
+
+/// How far the pictures and the sound that are converted have been read.
+int64_t Demuxer::Reached() const {
+    int64_t reached = INT64_MIN + kLatest;
+    for (const auto& [stream, queue] : queues_)
+        if (!queue.beside)
+            reached = std::max(reached, queue.end.value_or(reached));
+    return reached;
+}
+
+/// Whether the taker of a stream that is read beside the others has to wait for more to be read.
+bool Demuxer::IsAwaited(const Queue& queue) const {
+    return queue.packets.empty() && queue.end.value_or(INT64_MIN) < queue.wanted &&
+           Reached() - kLatest < queue.wanted && Held() < kMostBytes;
+}
+
+Demuxer::Beside Demuxer::TakeBeside(int stream, int64_t until, bool wait) {
+    std::unique_lock lock(mutex_);
+    Queue& queue = queues_.at(stream);
+    if (wait && queue.packets.empty()) {
+        Start();
+        queue.wanted = until;
+        changed_.notify_all();
+        WaitAndTell(
+            changed_, lock, [&] { return stopping_ || ended_ || !IsAwaited(queue); },
+            L"Movie::What goes beside pictures and sound waits for the source");
+        queue.wanted = INT64_MIN;
+    }
+    if (stopping_ || queue.packets.empty())
+        return {nullptr, stopping_ || ended_};
+    av::Packet packet = std::move(queue.packets.front());
+    queue.packets.pop_front();
+    queue.bytes -= static_cast<std::size_t>(packet->size);
+    return {std::move(packet), false};
 }
 
 void Demuxer::Stop() {
@@ -174,12 +212,14 @@ std::size_t Demuxer::Bytes() const {
 /// Whether each queue has so many packets, or all together have so many bytes, and nobody waits for a packet.
 bool Demuxer::Holds(std::size_t packets, std::size_t bytes) const {
     bool allFilled = true;
+    std::size_t held = 0;
     for (const auto& [stream, queue] : queues_) {
-        if (queue.packets.empty() && !Silence(queue))
+        if (queue.beside ? IsAwaited(queue) : queue.packets.empty() && !Silence(queue))
             return false;
-        allFilled = allFilled && queue.packets.size() >= packets;
+        allFilled = allFilled && (queue.beside || queue.packets.size() >= packets);
+        held += queue.beside ? 0 : queue.bytes;
     }
-    return allFilled || Held() >= bytes;
+    return allFilled || held >= bytes;
 }
 
 /// Waits until there is something to read for. False when there is nothing any more.
@@ -250,7 +290,8 @@ void Demuxer::RepairClock(AVPacket& packet) {
     const int64_t stamp = av_rescale_q(packet.dts, stream->time_base, mediaBase);
     const auto due = due_.find(packet.stream_index);
     int64_t shift = clockShift_;
-    if (due != due_.end()) {
+    const bool sparse = stream->codecpar->codec_type == AVMEDIA_TYPE_SUBTITLE; // its steps tell nothing
+    if (due != due_.end() && !sparse) {
         const auto ahead = [&](int64_t candidate) { return stamp + candidate - due->second; };
         // Where the clock changes, the last packets of one stream can come after the first ones of the other.
         if (std::abs(ahead(earlierShift_)) < std::abs(ahead(shift)))

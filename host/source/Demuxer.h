@@ -18,6 +18,7 @@
 #include <optional>
 #include <thread>
 #include <variant>
+#include <vector>
 
 namespace movieconv {
 
@@ -28,6 +29,9 @@ public:
     ~Demuxer();
     Demuxer(const Demuxer&) = delete;
     Demuxer& operator=(const Demuxer&) = delete;
+
+    /// Reads these streams beside the others, for TakeBeside. Only before everything else.
+    void ReadBeside(const std::vector<int>& streams);
 
     /// Moves so far back that everything from `seconds` on can be decoded. Only before the first packet is
     /// taken; a second call with the same time does nothing, so that both decoders may ask. False when the
@@ -40,6 +44,17 @@ public:
     /// The same for sound, or the media time up to which there is none, when that is known: reading is far
     /// beyond it.
     std::variant<av::Packet, int64_t> TakeOrSilence(int stream);
+
+    /// What TakeBeside found.
+    struct Beside {
+        av::Packet packet; ///< Null when there is none.
+        bool ended;        ///< None will come any more.
+    };
+
+    /// The next packet of a stream that is read beside the others. What is silent for long never makes
+    /// reading run on: without `wait` there may just be none at hand. With it the answer is certain, as far
+    /// as sources keep what belongs together within ten seconds: there is none that begins before `until`.
+    Beside TakeBeside(int stream, int64_t until, bool wait);
 
     /// Ends reading and wakes everyone who waits.
     void Stop();
@@ -60,6 +75,8 @@ private:
         std::optional<int64_t> end;      // in media time, of what was read
         int64_t silentUntil = INT64_MIN; // told to the taker
         bool mayBeSilent = false;
+        bool beside = false;
+        int64_t wanted = INT64_MIN; // up to there its taker waits for packets
     };
 
     void Start();
@@ -67,6 +84,8 @@ private:
     template <class Known>
     av::Packet Take(std::unique_lock<std::mutex>& lock, Queue& queue, Known known);
     std::optional<int64_t> Silence(const Queue& queue) const;
+    int64_t Reached() const;
+    bool IsAwaited(const Queue& queue) const;
     std::size_t Held() const;
     bool AwaitDemand();
     bool ReadOne();

@@ -23,6 +23,37 @@ void Movie::EndPicturesAt(double seconds) {
         pictures_->EndAt(seconds);
 }
 
+void Movie::SetBounds(double begin, bool ends, bool isCut) {
+    bounds_.begin = ToMediaTime(begin);
+    bounds_.ends = ends;
+    bounds_.isCut = isCut;
+}
+
+BesideSound& Movie::ReadSoundBeside(int stream) {
+    const SoundStreamInfo& sound = *Info().streams[static_cast<std::size_t>(stream)].sound;
+    auto track = std::make_unique<BesideSound>(source_.Reader(), StreamOf(stream), sound, demuxer_, bounds_,
+                                               failures_);
+    BesideSound& made = *track;
+    AddBeside(stream, std::move(track));
+    return made;
+}
+
+BesidePackets& Movie::ReadPacketsBeside(int stream) {
+    auto track = std::make_unique<BesidePackets>(
+        [this, stream](int64_t until, bool wait) { return demuxer_.TakeBeside(stream, until, wait); },
+        [this](int64_t stamp, AVRational timeBase) { return source_.Reader().MediaTime(stamp, timeBase); },
+        StreamOf(stream).time_base, bounds_, failures_);
+    BesidePackets& made = *track;
+    AddBeside(stream, std::move(track));
+    return made;
+}
+
+void Movie::AddBeside(int stream, std::unique_ptr<BesideTrack> track) {
+    besideStreams_.push_back(stream);
+    demuxer_.ReadBeside(besideStreams_);
+    beside_.push_back(std::move(track));
+}
+
 void Movie::Stop() {
     demuxer_.Stop();
     if (pictures_)
@@ -43,8 +74,6 @@ std::optional<Shortfall> Movie::Missing() const {
 
 std::vector<std::string> Movie::Complaints() const {
     std::vector<std::string> texts;
-    if (!source_.LeftOut().empty())
-        texts.push_back(source_.LeftOut());
     if (pictures_ && pictures_->Deinterlaced())
         texts.emplace_back("interlaced pictures were made progressive");
     if (pictures_ && IsHdr(*Info().pictures) && !choice_.keepHdr)

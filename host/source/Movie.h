@@ -2,6 +2,7 @@
 #ifndef MOVIECONV_HOST_SOURCE_MOVIE_H
 #define MOVIECONV_HOST_SOURCE_MOVIE_H
 
+#include "host/source/BesideTrack.h"
 #include "host/source/Demuxer.h"
 #include "host/source/Failures.h"
 #include "host/source/PictureDecoder.h"
@@ -43,6 +44,22 @@ public:
     /// conversion.
     void EndPicturesAt(double seconds);
 
+    /// How the output divides the source, in seconds, for the streams beside. Only before the conversion, and
+    /// before ReadBeside.
+    void SetBounds(double begin, bool ends, bool isCut);
+
+    /// Reads a stream beside those that are converted, as PCM or as its packets; the track
+    /// lives as long as the movie. Once for a stream, only before the conversion. Throws SourceError.
+    BesideSound& ReadSoundBeside(int stream);
+    BesidePackets& ReadPacketsBeside(int stream);
+
+    /// A stream of Info() as the container describes it. Valid until the conversion.
+    const AVStream& StreamOf(int stream) const { return *source_.Reader().Context()->streams[stream]; }
+
+    /// Where the file ends that is being written, in media time, when another one follows it: for the streams
+    /// beside. kOpen when it is not known (any more). Any thread.
+    void EndFileAt(int64_t time) { bounds_.fileEnd = time; }
+
     /// Ends both streams at once, so that nobody waits for a slow source. Any thread.
     void Stop();
 
@@ -61,12 +78,17 @@ public:
     std::vector<std::string> Complaints() const;
 
 private:
+    void AddBeside(int stream, std::unique_ptr<BesideTrack> track);
+
     const SourceChoice choice_;
     Source source_;
     Failures failures_;
     Demuxer demuxer_;
     std::unique_ptr<PictureDecoder> pictures_;
     std::unique_ptr<SoundDecoder> sound_;
+    BesideBounds bounds_;
+    std::vector<int> besideStreams_;
+    std::vector<std::unique_ptr<BesideTrack>> beside_;
 };
 
 } // namespace movieconv

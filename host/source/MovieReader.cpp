@@ -19,8 +19,18 @@ MovieReader::MovieReader(const std::string& path, bool playlists, std::shared_pt
 
 void MovieReader::Select(std::vector<int> streams) {
     selected_ = std::move(streams);
+    DiscardOthers();
+}
+
+void MovieReader::SelectBeside(std::vector<int> streams) {
+    beside_ = std::move(streams);
+    DiscardOthers();
+}
+
+void MovieReader::DiscardOthers() {
     for (unsigned i = 0; i < Context()->nb_streams; ++i) {
-        const bool wanted = std::count(selected_.begin(), selected_.end(), static_cast<int>(i)) > 0;
+        const bool wanted = std::count(selected_.begin(), selected_.end(), static_cast<int>(i)) > 0 ||
+                            std::count(beside_.begin(), beside_.end(), static_cast<int>(i)) > 0;
         Context()->streams[i]->discard = wanted ? AVDISCARD_DEFAULT : AVDISCARD_ALL;
     }
 }
@@ -68,11 +78,14 @@ bool MovieReader::Rewind() {
 
 void MovieReader::Reopen() {
     auto again = std::make_unique<MovieFile>(path_, playlists_, interruption_);
-    const int last = selected_.empty() ? -1 : *std::max_element(selected_.begin(), selected_.end());
+    int last = -1;
+    for (const std::vector<int>* streams : {&selected_, &beside_})
+        for (const int stream : *streams)
+            last = std::max(last, stream);
     if (last >= static_cast<int>(again->Context()->nb_streams))
         throw SourceError("\"" + path_ + "\" has changed meanwhile");
     file_ = std::move(again);
-    Select(std::move(selected_));
+    DiscardOthers();
 }
 
 } // namespace movieconv

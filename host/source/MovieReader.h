@@ -29,6 +29,9 @@ public:
     /// Lets nothing but these streams be read.
     void Select(std::vector<int> streams);
 
+    /// Lets these be read as well; they have no say in where reading begins.
+    void SelectBeside(std::vector<int> streams);
+
     /// A stamp in media time, from the start of the source.
     int64_t MediaTime(int64_t stamp, AVRational timeBase) const;
 
@@ -45,12 +48,15 @@ public:
     void Interrupt() { interruption_->Interrupt(); }
 
 private:
+    void DiscardOthers();
+
     const std::string path_;
     const bool playlists_;
     const std::shared_ptr<Interruption> interruption_;
     std::unique_ptr<MovieFile> file_;
     int64_t start_ = 0;
     std::vector<int> selected_;
+    std::vector<int> beside_;
 };
 
 } // namespace movieconv

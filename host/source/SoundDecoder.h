@@ -6,8 +6,8 @@
 
 #include "host/source/Demuxer.h"
 #include "host/source/Failures.h"
-#include "host/source/SoundTimeline.h"
-#include "host/source/StreamDecoder.h"
+#include "host/source/PcmDecoder.h"
+#include "host/source/Source.h"
 #include "media/Decoders.h"
 #include "thread/BoundedQueue.h"
 
@@ -40,38 +40,25 @@ public:
     bool RanDry() const { return ranDry_; }
 
 private:
-    using Chunk = std::vector<uint8_t>; // whole samples in the engine's form
-
     void Run();
     void DecodeAll();
-    bool Accept(const AVFrame& frame);
-    bool FitResampler(const AVFrame& frame);
-    Chunk Resample(const AVFrame* frame);
-    bool PushPlaced(std::optional<int64_t> stamp, const Chunk& chunk);
     bool PushSilence(int64_t samples);
-    bool Push(Chunk chunk);
+    bool Push(PcmDecoder::Chunk chunk);
 
-    const MovieReader& reader_;
     Demuxer& demuxer_;
     Failures& failures_;
     const int stream_;
-    const AVRational timeBase_;
     AudioSourceInfo info_{};
     int64_t frameBytes_ = 0; // of one sample of all channels
     int64_t blockBytes_ = 0;
     int64_t begin_ = 0;
 
     // The decoding thread's.
-    StreamDecoder decoder_;
-    av::Resampler resampler_;
-    av::ChannelLayout outputLayout_;
-    av::Frame inputForm_; // format, rate and layout that the resampler is made for
-    std::optional<SoundTimeline> timeline_;
-    bool refused_ = false;      // nobody takes sound any more
-    int64_t damagedBefore_ = 0; // the begin, where a seek may land amid a frame
+    PcmDecoder decoder_;
+    bool refused_ = false; // nobody takes sound any more
 
     // Between the threads.
-    BoundedQueue<Chunk> queue_;
+    BoundedQueue<PcmDecoder::Chunk> queue_;
     std::atomic<int64_t> damaged_{0};
     std::atomic<int> corrections_{0};
     std::atomic<bool> ranDry_{false};
@@ -79,7 +66,7 @@ private:
     std::thread thread_;
 
     // The engine worker's.
-    Chunk current_;
+    PcmDecoder::Chunk current_;
     int64_t used_ = 0; // bytes of it
     AudioFrame block_{};
 };

@@ -33,7 +33,6 @@ Source::Source(const std::string& path, const SourceChoice& choice,
     info_.chapters = DescribeChapters(context, reader_.Start());
     info_.tags = DescribeTags(context.metadata);
     const ChosenStreams chosen = ChooseStreams(info_.streams, choice);
-    leftOut_ = TellLeftOut(info_.streams, choice, chosen);
     std::vector<int> selected;
     if (chosen.pictures >= 0) {
         selected.push_back(chosen.pictures);

@@ -25,9 +25,6 @@ public:
     MovieReader& Reader() { return reader_; }
     const MovieReader& Reader() const { return reader_; }
 
-    /// Which streams are not converted although they are of the kinds asked for; empty when none is.
-    const std::string& LeftOut() const { return leftOut_; }
-
     /// The content of a cover or an attachment; empty for other streams.
     std::vector<uint8_t> StoredFile(int stream) const;
 
@@ -41,7 +38,6 @@ private:
 
     MovieReader reader_;
     SourceInfo info_;
-    std::string leftOut_;
 };
 
 } // namespace movieconv

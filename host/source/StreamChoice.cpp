@@ -1,7 +1,6 @@
 #include "host/source/StreamChoice.h"
 
 #include <algorithm>
-#include <fmt/format.h>
 #include <tuple>
 
 namespace movieconv {
@@ -55,25 +54,6 @@ ChosenStreams ChooseStreams(const std::vector<StreamInfo>& streams, const Source
             Best(streams, IsSound, [&](const StreamInfo& stream) { return SoundRank(stream, programs); });
     }
     return chosen;
-}
-
-std::string TellLeftOut(const std::vector<StreamInfo>& streams, const SourceChoice& choice,
-                        const ChosenStreams& chosen) {
-    std::string text;
-    const auto tell = [&](StreamKind kind, const char* name, bool wanted, int index) {
-        std::string others;
-        for (const StreamInfo& stream : streams)
-            if (wanted && stream.kind == kind && stream.index != index)
-                others += fmt::format("{}{}", others.empty() ? "" : ", ", stream.index);
-        if (!others.empty() && index >= 0) {
-            text +=
-                fmt::format("{}of its {} stream {} is converted, {} left out", text.empty() ? "" : "; ", name,
-                            index, others.find(',') != std::string::npos ? others + " are" : others + " is");
-        }
-    };
-    tell(StreamKind::kPictures, "pictures", choice.pictures, chosen.pictures);
-    tell(StreamKind::kSound, "sound", choice.sound, chosen.sound);
-    return text;
 }
 
 } // namespace movieconv

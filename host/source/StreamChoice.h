@@ -4,7 +4,6 @@
 
 #include "host/source/SourceInfo.h"
 
-#include <string>
 #include <vector>
 
 namespace movieconv {
@@ -19,11 +18,6 @@ struct ChosenStreams {
 /// to the same broadcast programme, is no commentary and not made for people who see or hear little, if there
 /// is another; then as for pictures, with channels for size. Only what can be decoded.
 ChosenStreams ChooseStreams(const std::vector<StreamInfo>& streams, const SourceChoice& choice);
-
-/// Which pictures and sound of the kinds asked for are not converted, in a sentence that says what is
-/// instead; empty when none is left out.
-std::string TellLeftOut(const std::vector<StreamInfo>& streams, const SourceChoice& choice,
-                        const ChosenStreams& chosen);
 
 } // namespace movieconv
 

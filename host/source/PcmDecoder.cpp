@@ -1,0 +1,117 @@
+#include "host/source/PcmDecoder.h"
+
+#include <algorithm>
+#include <utility>
+
+namespace movieconv {
+namespace {
+
+AVSampleFormat OutputFormat(const AudioFormat& sound) {
+    return sound.nBitsPerSample == 32 ? AV_SAMPLE_FMT_S32 : AV_SAMPLE_FMT_S16;
+}
+
+/// A layout with places for its channels: some sources tell only how many there are.
+void CopyLayout(AVChannelLayout& target, const AVChannelLayout& source) {
+    if (source.order == AV_CHANNEL_ORDER_UNSPEC) {
+        av_channel_layout_uninit(&target);
+        av_channel_layout_default(&target, source.nb_channels);
+    } else {
+        av_channel_layout_copy(&target, &source);
+    }
+}
+
+} // namespace
+
+PcmDecoder::PcmDecoder(const MovieReader& reader, const AVStream& stream, const SoundStreamInfo& sound,
+                       Sink sink)
+    : reader_(reader),
+      sink_(std::move(sink)),
+      timeBase_(stream.time_base),
+      frameBytes_(static_cast<int64_t>(sound.channels) * sound.bitsPerSample / 8),
+      decoder_(*stream.codecpar, timeBase_, 1),
+      inputForm_(av::NewFrame()) {
+    format_ = {sound.sampleRate, sound.channels, sound.bitsPerSample,
+               static_cast<int32_t>(sound.sampleRate * frameBytes_), sound.duration};
+    CopyLayout(*outputLayout_.Get(), stream.codecpar->ch_layout);
+}
+
+void PcmDecoder::Begin(int64_t begin) {
+    begin_ = begin;
+    timeline_.emplace(format_.nSampleRate, begin);
+}
+
+bool PcmDecoder::Decode(const AVPacket* packet) {
+    const bool goesOn = decoder_.Decode(packet, [this](AVFrame& frame) { return Accept(frame); });
+    if (begin_ > 0 && timeline_->Position() == 0)
+        damagedBefore_ = decoder_.Damaged();
+    if (packet == nullptr && resampler_)
+        PushPlaced(std::nullopt, Resample(nullptr));
+    return goesOn && packet != nullptr;
+}
+
+bool PcmDecoder::FillTo(int64_t time) {
+    const int64_t samples = timeline_->FillTo(time);
+    return samples == 0 || sink_.silence(samples);
+}
+
+bool PcmDecoder::Accept(const AVFrame& frame) {
+    if (frame.nb_samples <= 0 || !FitResampler(frame))
+        return true;
+    std::optional<int64_t> stamp;
+    if (frame.best_effort_timestamp != AV_NOPTS_VALUE)
+        stamp = reader_.MediaTime(frame.best_effort_timestamp, timeBase_);
+    return PushPlaced(stamp, Resample(&frame));
+}
+
+/// Makes a resampler for the frame's form if the last frame had another one. False when there is none for it.
+bool PcmDecoder::FitResampler(const AVFrame& frame) {
+    const bool fits = resampler_ && frame.format == inputForm_->format &&
+                      frame.sample_rate == inputForm_->sample_rate &&
+                      frame.ch_layout.nb_channels == inputForm_->ch_layout.nb_channels;
+    if (fits)
+        return true;
+    if (resampler_)
+        PushPlaced(std::nullopt, Resample(nullptr));
+    inputForm_->format = frame.format;
+    inputForm_->sample_rate = frame.sample_rate;
+    CopyLayout(inputForm_->ch_layout, frame.ch_layout);
+    SwrContext* resampler = resampler_.release();
+    int result = swr_alloc_set_opts2(
+        &resampler, outputLayout_.Get(), OutputFormat(format_), format_.nSampleRate, &inputForm_->ch_layout,
+        static_cast<AVSampleFormat>(frame.format), frame.sample_rate, 0, nullptr);
+    resampler_.reset(resampler);
+    if (result >= 0)
+        result = swr_init(resampler_.get());
+    if (result < 0) {
+        resampler_.reset();
+        av::CheckMemory(result);
+    }
+    return result >= 0;
+}
+
+/// The frame's samples in the engine's form; without a frame, what the resampler still holds.
+PcmDecoder::Chunk PcmDecoder::Resample(const AVFrame* frame) {
+    const int inputSamples = frame != nullptr ? frame->nb_samples : 0;
+    const int room = swr_get_out_samples(resampler_.get(), inputSamples);
+    if (room <= 0)
+        return {};
+    Chunk chunk(static_cast<std::size_t>(room * frameBytes_));
+    uint8_t* output = chunk.data();
+    const auto** input = frame != nullptr ? const_cast<const uint8_t**>(frame->extended_data) : nullptr;
+    const int samples = swr_convert(resampler_.get(), &output, room, input, inputSamples);
+    av::CheckMemory(samples);
+    chunk.resize(static_cast<std::size_t>(std::max(samples, 0) * frameBytes_));
+    return chunk;
+}
+
+/// Hands out the samples at their place on the timeline. False when nobody takes them any more.
+bool PcmDecoder::PushPlaced(std::optional<int64_t> stamp, const Chunk& chunk) {
+    const auto placement = timeline_->Place(stamp, static_cast<int64_t>(chunk.size()) / frameBytes_);
+    if (placement.silence > 0 && !sink_.silence(placement.silence))
+        return false;
+    if (placement.cut * frameBytes_ == static_cast<int64_t>(chunk.size()))
+        return true;
+    return sink_.sound(Chunk(chunk.begin() + placement.cut * frameBytes_, chunk.end()));
+}
+
+} // namespace movieconv

@@ -1,0 +1,158 @@
+#include "writer/BesideStage.h"
+
+#include "media/MediaRecords.h"
+#include "writer/SoundStage.h"
+
+#include <algorithm>
+#include <utility>
+
+namespace writer {
+namespace {
+
+constexpr size_t kMostSteps = 8;
+constexpr int64_t kStep = kTicksPerSecond / 10;
+
+/// Sound that is encoded as the engine's is.
+class EncodedSound final : public BesideTrack {
+public:
+    EncodedSound(const TrackPlan& plan, const Container& container, EncoderFlags flags)
+        : plan_(plan),
+          carriage_(FindCarriage(container, plan.sound->codec->code)),
+          stage_(*plan.sound, flags),
+          parameters_(avcodec_parameters_alloc()) {
+        if (!parameters_)
+            throw std::bad_alloc();
+        av::CheckMemory(avcodec_parameters_from_context(parameters_.get(), &stage_.Encoder()));
+    }
+
+    MuxedStream Stream() const override {
+        const AVCodecContext& encoder = stage_.Encoder();
+        return {parameters_.get(), {1, encoder.sample_rate}, {0, 1}, {0, 1}, encoder.initial_padding,
+                &carriage_,        &plan_.track->label};
+    }
+
+    void Start(PacketTaker take, StageFailure failed) override {
+        take_ = std::move(take);
+        failed_ = std::move(failed);
+    }
+
+    bool Take(const WriterTrackItem& item, int64_t time) override {
+        const AudioFrame& frame = *item.pSound;
+        const PcmFormat format{frame.nSampleRate, frame.nChannels, frame.nBitsPerSample};
+        if (!format.Valid() || frame.pData == nullptr || frame.nLength <= 0)
+            return true;
+        int64_t skipped = 0; // bytes before the file's begin
+        if (!started_) {
+            const int64_t early = av_rescale(-time, format.rate, kTicksPerSecond);
+            skipped = early > kRounding ? early * format.BytesPerFrame() : 0;
+            if (skipped >= frame.nLength)
+                return true;
+            Begin(early < -kRounding ? time : 0);
+        }
+        return stage_.Push({format, {frame.pData + skipped, frame.pData + frame.nLength}});
+    }
+
+    void Finish() override {
+        if (!started_ && plan_.sound->neverEmpty)
+            Begin(0);
+        stage_.Finish();
+    }
+    void Cancel() override { stage_.Cancel(); }
+    void Join() override { stage_.Join(); }
+
+private:
+    static constexpr int64_t kRounding = 2; // samples by which a track may miss the begin of its file
+
+    void Begin(int64_t time) {
+        started_ = true;
+        stage_.Start(
+            time, take_, [](int) {}, failed_);
+    }
+
+    const TrackPlan& plan_;
+    const Carriage& carriage_;
+    SoundStage stage_;
+    av::CodecParameters parameters_;
+    PacketTaker take_;
+    StageFailure failed_;
+    bool started_ = false;
+};
+
+} // namespace
+
+std::unique_ptr<BesideTrack> MakeBesideTrack(const TrackPlan& plan, const Container& container,
+                                             EncoderFlags flags) {
+    return std::make_unique<EncodedSound>(plan, container, flags);
+}
+
+BesideStage::BesideStage()
+    : thread_(kMostSteps, 0,
+              {L"MediaWriter::The conversion waits for further tracks",
+               L"MediaWriter::Further tracks wait for the conversion"}) {}
+
+BesideStage::~BesideStage() {
+    Cancel();
+    Join();
+}
+
+void BesideStage::Add(const TrackPlan& plan, const Container& container, EncoderFlags flags, Muxer& muxer) {
+    std::unique_ptr<BesideTrack> writer = MakeBesideTrack(plan, container, flags);
+    const int stream = muxer.AddStream(writer->Stream());
+    tracks_.push_back({&plan, stream, std::move(writer)});
+}
+
+void BesideStage::Start(int64_t begin, const std::function<void(AVPacket& packet, int stream)>& write,
+                        const StageFailure& failed) {
+    begin_ = begin;
+    for (Track& track : tracks_)
+        track.writer->Start([write, stream = track.stream](AVPacket& packet) { write(packet, stream); },
+                            failed);
+    thread_.Start([this] { Run(); }, failed);
+}
+
+void BesideStage::Reach(int64_t sourceTime) {
+    if (!Started() || sourceTime < reached_ + kStep)
+        return;
+    reached_ = sourceTime;
+    thread_.Queue().Push({sourceTime, false});
+}
+
+void BesideStage::Finish(int64_t sourceTime) {
+    if (Started())
+        thread_.Queue().Push({sourceTime, true});
+    thread_.Finish();
+}
+
+void BesideStage::Cancel() {
+    thread_.Cancel();
+    for (Track& track : tracks_)
+        track.writer->Cancel();
+}
+
+void BesideStage::Join() {
+    thread_.Join();
+    for (Track& track : tracks_)
+        track.writer->Join();
+}
+
+void BesideStage::Run() {
+    while (const std::optional<Step> step = thread_.Queue().Pop())
+        for (Track& track : tracks_)
+            Read(track, *step);
+    for (Track& track : tracks_)
+        track.writer->Finish();
+}
+
+void BesideStage::Read(Track& track, const Step& step) {
+    const auto next = [&](WriterTrackItem& item) {
+        return track.plan->track->next(track.plan->track->context, step.time, step.closing ? 1 : 0, &item) !=
+               0;
+    };
+    WriterTrackItem item{};
+    while (!thread_.Cancelled() && next(item))
+        if (!track.writer->Take(item, item.llTime - *begin_))
+            break;
+    track.writer->Reach(step.time - *begin_);
+}
+
+} // namespace writer
