@@ -67,7 +67,8 @@ struct Warning {
 
 /// Something of the source that its output does not hold, although the conversion goes well.
 struct NotCarried {
-    std::string kind;          ///< "subtitles", "chapters", "cover", "attachment" or "data".
+    /// "pictures", "sound", "subtitles", "chapters", "cover", "attachment" or "data".
+    std::string kind;
     std::optional<int> number; ///< Of the stream in the source; nothing for chapters.
     std::string codec;
     std::string language; ///< Empty when it is not known.

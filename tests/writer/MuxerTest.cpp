@@ -65,7 +65,8 @@ public:
         const av::ChannelLayout mono(1);
         av_channel_layout_copy(&parameters->ch_layout, mono.Get());
         static constexpr writer::Carriage kUsual;
-        muxer_.AddStream({parameters.get(), {1, 48000}, {0, 1}, {0, 1}, 0, &kUsual});
+        static const writer::TrackLabel kUnnamed;
+        muxer_.AddStream({parameters.get(), {1, 48000}, {0, 1}, {0, 1}, 0, &kUsual, &kUnnamed});
         muxer_.WriteHeader();
     }
 

@@ -1,0 +1,103 @@
+// Further tracks of a movie come into the output beside its pictures and its first sound.
+#include "tests/support/Folder.h"
+#include "tests/support/Program.h"
+#include "tests/support/TestMovies.h"
+
+#include <gtest/gtest.h>
+
+#include <string>
+
+namespace {
+
+using program::Call;
+using program::Result;
+
+using test_movies::Args;
+using test_movies::CountedPictures;
+using test_movies::Join;
+
+/// Six seconds: German sound of one channel, English comments of two at another rate, which begin late.
+std::string TwoSounds() {
+    const Args sounds{"-f",         "lavfi",
+                      "-i",         "aevalsrc=0.4*sin(500*t*t):s=48000:d=6",
+                      "-f",         "lavfi",
+                      "-itsoffset", "0.5",
+                      "-i",         "aevalsrc=0.4*sin(700*t*t)|0.3*sin(400*t*t):s=44100:d=5"};
+    const Args outputs{"-map",
+                       "0",
+                       "-map",
+                       "1",
+                       "-map",
+                       "2",
+                       "-c:v",
+                       "mpeg4",
+                       "-c:a",
+                       "flac",
+                       "-metadata:s:a:0",
+                       "language=ger",
+                       "-metadata:s:a:1",
+                       "language=eng",
+                       "-metadata:s:a:1",
+                       "title=Comments",
+                       "-disposition:a:1",
+                       "comment"};
+    return test_movies::Make("two_sounds.mkv", Join(CountedPictures(6), sounds, outputs));
+}
+
+std::string SoundOf(const std::string& path, int track) {
+    const Result read = program::Run(
+        {"ffmpeg", "-v", "error", "-i", path, "-map", "0:a:" + std::to_string(track), "-f", "s16le", "-"});
+    EXPECT_EQ(read.err, "") << path;
+    return read.out;
+}
+
+TEST(Tracks, FurtherSoundComesIntoEveryFormatThatHoldsSeveral) {
+    const Folder folder;
+    for (const char* name : {"out.mp4", "out.mov", "out.mkv", "out.webm", "out.avi", "out.ts", "out.m4a"}) {
+        SCOPED_TRACE(name);
+        const Result made = Call({TwoSounds(), folder / name, "--length", "1", "--progress", "none"});
+        ASSERT_EQ(made.code, 0) << made.err;
+        EXPECT_EQ(made.err.find("not carried: sound"), std::string::npos) << made.err;
+        const std::string read =
+            program::Run({"ffprobe", "-v", "error", "-select_streams", "a", "-show_entries",
+                          "stream=channels,sample_rate:stream_tags=language:stream_disposition=comment",
+                          "-of", "compact", folder / name})
+                .out;
+        EXPECT_NE(read.find("channels=1"), std::string::npos) << read;
+        EXPECT_GT(read.find("channels=2"), read.find("channels=1")) << read;
+        EXPECT_NE(read.find("channels=2"), std::string::npos) << read;
+        if (std::string(name) != "out.avi") {
+            EXPECT_GT(read.find("language=eng"), read.find("language=ger")) << read;
+            EXPECT_NE(read.find("language=eng"), std::string::npos) << read;
+        }
+        if (std::string(name) == "out.mkv") {
+            EXPECT_GT(read.find("comment=1"), read.find("comment=0")) << read;
+        }
+    }
+    const Result flash = Call({TwoSounds(), folder / "out.flv", "--length", "1", "--progress", "json"});
+    EXPECT_NE(
+        flash.out.find(R"("event":"not_carried","kind":"sound","number":2,"codec":"flac","language":"eng")"),
+        std::string::npos)
+        << flash.out;
+}
+
+TEST(Tracks, ClipsJoinToTheSample) {
+    const Folder folder;
+    ASSERT_EQ(Call({TwoSounds(), folder / "out.mkv", "--audio-codec", "FLAC", "--split", "1.7", "-q"}).code,
+              0);
+    for (const int track : {0, 1}) {
+        SCOPED_TRACE(track);
+        std::string joined;
+        for (const char* name : {"out_00.mkv", "out_01.mkv", "out_02.mkv", "out_03.mkv"})
+            joined += SoundOf(folder / name, track);
+        const std::string whole = SoundOf(TwoSounds(), track);
+        // The second track is preceded by the silence up to its begin, which the container rounds.
+        ASSERT_GE(joined.size(), whole.size());
+        const std::size_t silence = joined.size() - whole.size();
+        EXPECT_NEAR(static_cast<double>(silence), track == 0 ? 0 : 0.5 * 44100 * 4, 100);
+        EXPECT_EQ(joined.find_first_not_of('\0'), silence + whole.find_first_not_of('\0'));
+        EXPECT_TRUE(joined.substr(silence) == whole);
+    }
+}
+
+} // namespace
