@@ -4,6 +4,7 @@
 #include "host/convert/CarryOver.h"
 #include "host/convert/CodecPlan.h"
 #include "host/convert/EncodePlan.h"
+#include "host/convert/Judgement.h"
 #include "host/convert/Room.h"
 #include "host/convert/SizePlan.h"
 #include "text/Path.h"
@@ -276,7 +277,8 @@ Verdict Course::Conclude() {
     Show();
     ReportComplaints();
     Verdict verdict;
-    verdict.failure = FindFailure();
+    verdict.failure = FindFailure({request_, files_, brokenOff_, movie_.ReadError(), WhyItEndedEarly(),
+                                   userStopped_, outcome_, request_.begin + Position()});
     verdict.outcome = verdict.failure                               ? Outcome::kFailed
                       : userStopped_ && outcome_ == kOutcomeStopped ? Outcome::kStopped
                                                                     : Outcome::kDone;
@@ -285,41 +287,6 @@ Verdict Course::Conclude() {
     verdict.bytes = files_.Bytes();
     verdict.files = files_.Complete();
     return verdict;
-}
-
-/// What went wrong, by the writer's word, the engine's and the source's.
-std::optional<Failure> Course::FindFailure() {
-    if (brokenOff_)
-        return brokenOff_;
-    if (files_.FirstFailure())
-        return files_.FirstFailure();
-    if (const std::optional<std::string> missing = files_.FindMissing())
-        return Failure(Category::kOutput, *missing);
-    std::string reason = movie_.ReadError();
-    if (files_.Complete() == 0) { // the writer keeps no empty file
-        if (userStopped_ && reason.empty())
-            return std::nullopt;
-        return Failure(Category::kSource,
-                       reason.empty() ? fmt::format("\"{}\" holds nothing to convert", request_.input)
-                                      : fmt::format("cannot read \"{}\": {}", request_.input, reason));
-    }
-    if (reason.empty())
-        reason = WhyItEndedEarly();
-    if (!reason.empty() && !userStopped_) {
-        return Failure(Category::kSource,
-                       fmt::format("reading \"{}\" failed after {}: {}; what was read is converted",
-                                   request_.input, FormatTime(request_.begin + Position(), true), reason));
-    }
-    if (request_.maxSize && files_.Bytes() > *request_.maxSize) {
-        return Failure(Category::kOutput, fmt::format("\"{}\" has become larger than asked for: {}",
-                                                      request_.output, FormatBytes(files_.Bytes())));
-    }
-    if (outcome_ == kOutcomeCompleted || (userStopped_ && outcome_ == kOutcomeStopped))
-        return std::nullopt;
-    return Failure(Category::kInternal,
-                   fmt::format("the conversion broke off after {}{}",
-                               FormatTime(request_.begin + Position(), true),
-                               outcome_ == kOutcomeFailed ? ", for want of memory" : ""));
 }
 
 /// Why the source ended before what it promises, and before the length that was asked for; empty when it did

@@ -65,7 +65,6 @@ private:
     Phase CurrentPhase() const;
     void ReportProgress();
     Verdict Conclude();
-    std::optional<Failure> FindFailure();
     double Position() const;
     double Converted(double position) const;
     std::string WhyItEndedEarly() const;

@@ -204,7 +204,6 @@ TEST(Program, RefusesAndLeavesEverythingAsItWas) {
         const char* word;
     } refusals[] = {
         {{source, source, "-y"}, 2, "source itself"},
-        {{source, folder / "same.mkv", "-y"}, 2, "source itself"},
         {{source, folder / "out.mkv", "--preview", folder / "same.mkv"}, 2, "is the source"},
         {{source, folder / "out.mkv", "--log", folder / "out.mkv.part"}, 2, "is the output"},
         {{source, folder / "clip.mkv", "--split", "1", "--log", folder / "clip_100.mkv"}, 2, "is the output"},
@@ -215,30 +214,17 @@ TEST(Program, RefusesAndLeavesEverythingAsItWas) {
         {{source, folder / "out.mkv", "--log", folder / "there.mp4"}, 4, "not a log"},
         {{"--list-formats", "--log", folder / "link.mkv", "-y"}, 4, "a symbolic link"},
         {{source, folder / "out.mkv", "--log", "/dev/full", "-y"}, 4, "a device"},
-        {{source, folder / "link.mkv", "-y"}, 4, "a link to a missing file"},
         {{source, folder / "there.mp4"}, 4, "--overwrite"},
         {{source, folder / "clip.mp4", "--split", "1"}, 4, "clip_03.mp4"},
-        {{source, folder / "clip", "--split", "1", "-f", "mp4"}, 2, "extension"},
-        {{source, folder / (std::string(249, 'n') + ".mp4"), "--split", "1"}, 4, "too long"},
-        {{source, folder / (std::string(245, 'n') + ".mp4"), "--split", "0.1"}, 4, "too long"}, // many clips
-        {{source, folder / (std::string(500, '/') + std::string(15, 'n') + ".mp4"), "--split", "1"},
-         2,
-         "too long"},
         {{source, folder / (std::string(252, 'n') + ".mp4")}, 4, "too long"},
         {{source, folder / "out.mp4", "--preview", folder / (std::string(248, 'n') + ".png")}, 4, "too long"},
-        {{source, folder / "out.mp3", "--split", "1"}, 2, "needs pictures"},
         {{source, folder / "out.mp4", "--split", "0.01"}, 2, "--split takes"},
         {{source, folder / "out.mp4", "--length", "0"}, 2, "at least 0.001"},
         {{source, folder / "out.mp4", "--length", "9999999999"}, 2, "is not a time"},
-        {{source, folder / "there.mp4/out.mp4"}, 4, "is not a folder"},
         {{"--estimate", source, folder / "nowhere/out.mp4"}, 4, "nowhere"},
-        {{source, folder / "nowhere/out.mp4"}, 4, "nowhere"},
         {{source, "/proc/out.mp4"}, 4, "/proc"}, // where not even the superuser can create a file
-        {{source, folder.Path(), "-f", "mp4"}, 4, "is a folder"},
-        {{source, "/dev/null", "-f", "mp4", "-y"}, 4, "not a file"},
         {{folder.Path(), folder / "out.mp4"}, 3, "directory"},
         {{source, folder / "out.xyz"}, 2, "--format"},
-        {{source, folder / "out"}, 2, "--format"},
         {{folder / "body.mp4", folder / "out.mp4"}, 3, "index"},
         {{source, folder / "out.mp4", "--log", folder / "nowhere/log"}, 4, "nowhere/log"},
         {{folder / "none.mkv", folder / "out.mp4"}, 3, "none.mkv"},
@@ -251,11 +237,8 @@ TEST(Program, RefusesAndLeavesEverythingAsItWas) {
         {{source, folder / "out.mp4", "--begin", "9"}, 2, "--begin"},
         {{source, folder / "out.mp4", "--fit", "wide"}, 2, "\"wide\" is not borders|stretch"},
         {{"none.mkv", folder / "out.webm", "--video-codec", "XVID"}, 2, "cannot carry pictures as \"XVID\""},
-        {{"none.mkv", folder / "out.ts", "--audio-codec", "what"}, 2, "cannot carry sound as \"WHAT\""},
-        {{source, folder / "out.mp3", "--video-codec", "H264"}, 2, "cannot carry pictures"},
         {{source, folder / "out.mp4", "--video-codec", "H.264"}, 2, "four characters"},
         {{source, folder / "out.mp4", "--no-video", "--no-audio"}, 2, "--no-audio"},
-        {{source, folder / "out.mp3", "--no-audio"}, 2, "MP3"},
         {{source, folder / "out.mp4", "--frame-rate", "240"}, 2, "up to 200"},
         {{source}, 2, "OUTPUT"},
         {{}, 2, "INPUT"},
@@ -315,7 +298,7 @@ TEST(Program, KeepsAPreview) {
     ASSERT_TRUE(running.WaitFor("clip_opened"));
     const auto before = fs::last_write_time(folder / "now.png");
     while (fs::last_write_time(folder / "now.png") == before)
-        std::this_thread::sleep_for(std::chrono::milliseconds(5));
+        ASSERT_TRUE(running.WaitFor("\"event\":\"progress\""));
     WriteFile(folder / "precious", "precious");
     fs::rename(folder / "precious", folder / "now.png");
     running.Signal(SIGINT); // the last picture is shown, too
@@ -453,10 +436,7 @@ TEST(Program, GoesOnIgnoringWhatItsCallerIgnores) {
 }
 
 TEST(Program, FollowsKeysAndLeavesTheTerminalWhileItIsSuspended) {
-    using Clock = std::chrono::steady_clock;
-    constexpr std::chrono::seconds kSuspended{2};
     const Folder folder;
-    const Clock::time_point begin = Clock::now();
     Running running(Slowly(folder / "out.mp4"), true);
     ASSERT_TRUE(running.WaitFor("0:00:0[1-9] / "));
     running.Press(" ");
@@ -468,7 +448,6 @@ TEST(Program, FollowsKeysAndLeavesTheTerminalWhileItIsSuspended) {
     ASSERT_TRUE(running.WaitUntilSuspended());
     EXPECT_TRUE(running.Echoes());
     ASSERT_TRUE(running.WaitFor("\r\n")); // it left its line
-    std::this_thread::sleep_for(kSuspended);
     running.Signal(SIGCONT);
     ASSERT_TRUE(running.WaitFor("left"));
     EXPECT_FALSE(running.Echoes());
@@ -476,13 +455,6 @@ TEST(Program, FollowsKeysAndLeavesTheTerminalWhileItIsSuspended) {
     const Result result = running.Finish();
     EXPECT_EQ(result.code, 6) << result.out;
     EXPECT_GT(LookAt(folder / "out.mp4").pictures.size(), 0u);
-    const std::chrono::duration<double> most = Clock::now() - begin - kSuspended;
-    const std::size_t told = result.out.find("converted in 0:");
-    ASSERT_NE(told, std::string::npos) << result.out;
-    int minutes = 0;
-    double seconds = 0;
-    ASSERT_EQ(std::sscanf(&result.out[told], "converted in 0:%d:%lf", &minutes, &seconds), 2) << result.out;
-    EXPECT_LT(minutes * 60 + seconds, most.count());
 }
 
 class ProgramStalls : public testing::TestWithParam<const char*> {};
@@ -512,12 +484,15 @@ INSTANTIATE_TEST_SUITE_P(Begins, ProgramStalls, testing::Values("0", "6"));
 
 TEST(Program, WritesTheSameFileWhateverThePauses) {
     const Folder folder;
-    const Args encoding{"--length", "3", "--size", "640x480"};
-    ASSERT_EQ(Call(Join(Args{Flashing(), folder / "steady.mp4"}, encoding)).code, 0);
-    Running running(Join(Args{Flashing(), folder / "paused.mp4"}, encoding), true);
-    for (int i = 0; i < 6; ++i) {
+    const Args part{"--length", "4"};
+    ASSERT_EQ(Call(Join(Slowly(folder / "steady.mp4"), part)).code, 0);
+    Running running(Join(Slowly(folder / "paused.mp4"), part), true);
+    ASSERT_TRUE(running.WaitFor("0:00:0[0-9] / "));
+    for (int i = 0; i < 3; ++i) {
         running.Press(" ");
-        std::this_thread::sleep_for(std::chrono::milliseconds(10 + 17 * i % 50));
+        ASSERT_TRUE(running.WaitFor("paused"));
+        running.Press(" ");
+        ASSERT_TRUE(running.WaitFor("left"));
     }
     EXPECT_EQ(running.Finish().code, 0);
     EXPECT_EQ(ReadFile(folder / "steady.mp4"), ReadFile(folder / "paused.mp4"));

@@ -1,0 +1,52 @@
+#include "host/convert/Judgement.h"
+
+#include "api/MovieConv.h"
+#include "host/convert/Amounts.h"
+
+#include <fmt/format.h>
+
+namespace movieconv {
+namespace {
+
+/// Without a complete file, of which the writer keeps none that is empty.
+std::optional<Failure> WhyNothingIsThere(const Evidence& evidence) {
+    const std::string& input = evidence.request.input;
+    if (evidence.userStopped && evidence.readError.empty())
+        return std::nullopt;
+    return Failure(Category::kSource, evidence.readError.empty()
+                                          ? fmt::format("\"{}\" holds nothing to convert", input)
+                                          : fmt::format("cannot read \"{}\": {}", input, evidence.readError));
+}
+
+} // namespace
+
+std::optional<Failure> FindFailure(const Evidence& evidence) {
+    if (evidence.brokenOff)
+        return evidence.brokenOff;
+    const Request& request = evidence.request;
+    const FileLedger& files = evidence.files;
+    if (files.FirstFailure())
+        return files.FirstFailure();
+    if (const std::optional<std::string> missing = files.FindMissing())
+        return Failure(Category::kOutput, *missing);
+    if (files.Complete() == 0)
+        return WhyNothingIsThere(evidence);
+    const std::string& reason = evidence.readError.empty() ? evidence.shortfall : evidence.readError;
+    if (!reason.empty() && !evidence.userStopped) {
+        return Failure(Category::kSource,
+                       fmt::format("reading \"{}\" failed after {}: {}; what was read is converted",
+                                   request.input, FormatTime(evidence.reached, true), reason));
+    }
+    if (request.maxSize && files.Bytes() > *request.maxSize) {
+        return Failure(Category::kOutput, fmt::format("\"{}\" has become larger than asked for: {}",
+                                                      request.output, FormatBytes(files.Bytes())));
+    }
+    if (evidence.engineOutcome == kOutcomeCompleted ||
+        (evidence.userStopped && evidence.engineOutcome == kOutcomeStopped))
+        return std::nullopt;
+    return Failure(Category::kInternal,
+                   fmt::format("the conversion broke off after {}{}", FormatTime(evidence.reached, true),
+                               evidence.engineOutcome == kOutcomeFailed ? ", for want of memory" : ""));
+}
+
+} // namespace movieconv

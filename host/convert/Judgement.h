@@ -1,0 +1,31 @@
+// Whether a conversion was a success: it has to be proved.
+#ifndef MOVIECONV_HOST_CONVERT_JUDGEMENT_H
+#define MOVIECONV_HOST_CONVERT_JUDGEMENT_H
+
+#include "host/convert/FileLedger.h"
+#include "host/convert/Request.h"
+
+#include <optional>
+#include <string>
+
+namespace movieconv {
+
+/// What is known once a conversion has ended.
+struct Evidence {
+    const Request& request;
+    const FileLedger& files;          ///< By the writer's word, and by what stands on the disk now.
+    std::optional<Failure> brokenOff; ///< Why the conversion itself was ended, not by its user.
+    std::string readError;            ///< Why reading ended early; empty when it did not.
+    std::string shortfall;            ///< What the source promised and did not hold; empty when nothing.
+    bool userStopped = false;
+    int engineOutcome = 0; ///< kOutcome...
+    double reached = 0;    ///< Seconds, in the source.
+};
+
+/// What went wrong first, in the order of what explains most; nothing only when everything that the source
+/// holds, or up to where the user stopped, stands complete under its name.
+std::optional<Failure> FindFailure(const Evidence& evidence);
+
+} // namespace movieconv
+
+#endif

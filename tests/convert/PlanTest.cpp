@@ -1,0 +1,236 @@
+// What becomes of a request: formats, codecs, rates and sizes. Nothing is opened.
+#include "host/convert/CodecPlan.h"
+#include "host/convert/EncodePlan.h"
+#include "host/convert/Failure.h"
+#include "host/convert/Formats.h"
+#include "host/convert/SizePlan.h"
+#include "media/FourCC.h"
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <string>
+
+namespace {
+
+using namespace movieconv;
+
+SourceInfo Source(double seconds = 60) {
+    PictureStreamInfo pictures;
+    pictures.index = 0;
+    pictures.width = 1920;
+    pictures.height = 1080;
+    pictures.frameRate = pictures.peakRate = 25;
+    pictures.duration = seconds;
+    SoundStreamInfo sound;
+    sound.index = 1;
+    sound.sampleRate = 48000;
+    sound.channels = 6;
+    sound.duration = seconds;
+    SourceInfo source;
+    source.path = "source";
+    source.duration = seconds;
+    source.pictures = pictures;
+    source.sound = sound;
+    return source;
+}
+
+Request To(const std::string& output) {
+    Request request;
+    request.input = "source";
+    request.output = output;
+    return request;
+}
+
+/// What is refused, by category and reason; nothing when it is not.
+template <class Plan>
+std::optional<std::pair<Category, Reason>> Refused(Plan plan) {
+    try {
+        plan();
+        return std::nullopt;
+    } catch (const Failure& failure) {
+        EXPECT_NE(failure.Text(), "");
+        return std::pair(failure.Kind(), failure.Why());
+    }
+}
+
+TEST(Formats, AreFoundByCodeExtensionAndName) {
+    const struct {
+        const char* name;
+        uint32_t code;
+    } names[] = {{"mp4", FourCC("MP4 ")},
+                 {"MP4", FourCC("MP4 ")},
+                 {"mkv", FourCC("MKV ")},
+                 {"m2ts", FourCC("TS  ")},
+                 {"xyz", 0},
+                 {"", 0},
+                 {"mp4 movie", 0}};
+    for (const auto& [name, code] : names) {
+        const FileFormatInfo* format = FindFormat(name);
+        EXPECT_EQ(format != nullptr ? format->fccFormat : 0, code) << name;
+    }
+    const struct {
+        const char* path;
+        uint32_t code;
+    } paths[] = {{"a.mkv", FourCC("MKV ")},
+                 {"b.mp4/c.MKV", FourCC("MKV ")},
+                 {"b.mp4/c", 0},
+                 {"mkv", 0},
+                 {"a.mkv.part", 0},
+                 {"a.", 0}};
+    for (const auto& [path, code] : paths) {
+        const FileFormatInfo* format = FindFormatOfFile(path);
+        EXPECT_EQ(format != nullptr ? format->fccFormat : 0, code) << path;
+    }
+    EXPECT_EQ(ParseCode("h264"), FourCC("H264"));
+    EXPECT_EQ(ParseCode("aac"), FourCC("AAC "));
+    EXPECT_EQ(ParseCode("theora"), std::nullopt);
+    EXPECT_EQ(CodeName(FourCC("AAC ")), "AAC");
+}
+
+TEST(CodecPlan, WhatIsAskedForWinsOverWhatIsPreferred) {
+    const FileFormatInfo& mkv = *FindFormat("mkv");
+    const SourceInfo source = Source();
+    Request request = To("o.mkv");
+    EXPECT_EQ(PlanPictures(request, mkv, *source.pictures).codec, std::nullopt);
+    request.preferences.videoCodecs = {FourCC("H264"), FourCC("XVID")};
+    request.preferences.quality[FourCC("H264")].from = {{0, 20}, {720, 23}};
+    request.preferences.quality[0].from = {{0, 5}};
+    request.preferences.videoRate = 1'000'000;
+    request.preferences.fitWithin = Size{1280, 1280};
+    request.preferences.maxFrameRate = 30;
+    request.preferences.maxChannels = 2;
+    request.preferences.audioRate.from = {{1, 64'000}, {2, 128'000}, {6, 384'000}};
+    const PicturePlan preferred = PlanPictures(request, mkv, *source.pictures);
+    EXPECT_EQ(preferred.codec, FourCC("H264"));
+    EXPECT_EQ(preferred.quality, 23); // by the height of the source's pictures as they are made
+    EXPECT_EQ(preferred.rate, std::nullopt);
+    ASSERT_TRUE(preferred.size);
+    EXPECT_EQ(preferred.size->width, 1280);
+    EXPECT_EQ(preferred.size->height, 720);
+    EXPECT_EQ(preferred.frameRate, std::nullopt); // the source has fewer
+    const SoundPlan sound = PlanSound(request, mkv, *source.sound);
+    EXPECT_EQ(sound.channels, 2);
+    EXPECT_EQ(sound.rate, 128'000);
+
+    request.videoCodec = FourCC("XVID");
+    request.videoRate = 2'000'000;
+    request.size = Size{640, 640};
+    request.frameRate = 50;
+    request.channels = 6;
+    const PicturePlan asked = PlanPictures(request, mkv, *source.pictures);
+    EXPECT_EQ(asked.codec, FourCC("XVID"));
+    EXPECT_EQ(asked.quality, std::nullopt);
+    EXPECT_EQ(asked.rate, 2'000'000);
+    EXPECT_EQ(asked.size->height, 640);
+    EXPECT_EQ(asked.frameRate, 50);
+    EXPECT_EQ(PlanSound(request, mkv, *source.sound).rate, 384'000);
+}
+
+TEST(CodecPlan, RefusesWhatFormatOrCodecDoesNotHave) {
+    const std::pair codec{Category::kRequest, Reason::kCodec};
+    const std::pair other{Category::kRequest, Reason::kOther};
+    const SourceInfo source = Source();
+    Request webm = To("o.webm");
+    webm.videoCodec = FourCC("XVID");
+    EXPECT_EQ(Refused([&] { ChooseFormat(webm); }), codec);
+    webm.videoCodec.reset();
+    webm.preferences.videoCodecs = {FourCC("XVID"), FourCC("H264")}; // none of them
+    EXPECT_EQ(Refused([&] { ChooseFormat(webm); }), codec);
+    webm.preferences.videoCodecs.push_back(FourCC("VP90"));
+    EXPECT_EQ(Refused([&] { ChooseFormat(webm); }), std::nullopt);
+    EXPECT_EQ(Refused([&] { ChooseFormat(To("o.xyz")); }), std::pair(Category::kRequest, Reason::kNoFormat));
+    Request named = To("o.xyz");
+    named.preferences.format = FourCC("MKV ");
+    EXPECT_EQ(ChooseFormat(named).fccFormat, FourCC("MKV "));
+
+    Request quality = To("o.mkv");
+    quality.videoCodec = FourCC("H264");
+    quality.quality = 52;
+    EXPECT_EQ(Refused([&] { PlanPictures(quality, *FindFormat("mkv"), *source.pictures); }), other);
+    quality.quality = 51;
+    EXPECT_EQ(Refused([&] { PlanPictures(quality, *FindFormat("mkv"), *source.pictures); }), std::nullopt);
+    quality.videoCodec = FourCC("FFV1"); // without loss
+    EXPECT_EQ(Refused([&] { PlanPictures(quality, *FindFormat("mkv"), *source.pictures); }), other);
+}
+
+TEST(EncodePlan, FillsTheEnginesRecord) {
+    EncodeParam defaults{};
+    defaults.fccVideo = FourCC("XVID");
+    defaults.fccAudio = FourCC("AAC ");
+    defaults.nVideoBitrate = 512'000;
+    defaults.nChannels = 2;
+    const auto plan = [&](const Request& request, const SourceInfo& source) {
+        return PlanEncoding(defaults, ChooseFormat(request), request, source);
+    };
+    const EncodeParam usual = plan(To("o.mp4"), Source());
+    EXPECT_EQ(+usual.fccVideo, FourCC("XVID"));
+    EXPECT_EQ(+usual.nVideoBitrate, 512'000);
+    EXPECT_EQ(double{usual.dFrameRate}, 0); // the pictures keep their own times
+    EXPECT_EQ(+usual.bNoVideo, 0);
+    EXPECT_EQ(+usual.bNoAudio, 0);
+    // A format that does not carry the engine's codec gets its own first; one of a steady rate is told it.
+    EXPECT_EQ(+plan(To("o.webm"), Source()).fccVideo, ChooseFormat(To("o.webm")).fccVideoCodecs[0]);
+    EXPECT_EQ(double{plan(To("o.avi"), Source()).dFrameRate}, 25);
+    EXPECT_EQ(+plan(To("o.mp3"), Source()).bNoVideo, 1);
+    SourceInfo silent = Source();
+    silent.sound.reset();
+    EXPECT_EQ(+plan(To("o.mp4"), silent).bNoAudio, 1);
+    EXPECT_EQ(Refused([&] { plan(To("o.mp3"), silent); }), std::pair(Category::kRequest, Reason::kOther));
+    Request target = To("o.mp4");
+    target.videoRate = 1'000'000;
+    target.videoMaxRate = 2'000'000;
+    EXPECT_EQ(+plan(target, Source()).nVideoRateMode, 1);
+}
+
+TEST(EncodePlan, ReckonsTheLength) {
+    const struct {
+        double begin;
+        std::optional<double> length;
+        Certainty certainty;
+        double expected;
+    } cases[] = {{0, {}, Certainty::kKnown, 60},      {20, {}, Certainty::kKnown, 40},
+                 {50, 20, Certainty::kKnown, 10},     {50, 5, Certainty::kKnown, 5},
+                 {50, 20, Certainty::kEstimated, 20}, {70, {}, Certainty::kEstimated, 0}};
+    for (const auto& test : cases) {
+        Request request = To("o.mp4");
+        request.begin = test.begin;
+        request.length = test.length;
+        SourceInfo source = Source();
+        source.certainty = test.certainty;
+        EXPECT_EQ(LengthToConvert(request, source), test.expected) << test.begin;
+    }
+    Request late = To("o.mp4");
+    late.begin = 60;
+    EXPECT_EQ(Refused([&] { LengthToConvert(late, Source()); }),
+              std::pair(Category::kRequest, Reason::kBeginTooLate));
+}
+
+TEST(SizePlan, ChoosesRatesThatFit) {
+    for (const std::string output : {"o.mp4", "o.ts", "o.mp3"}) {
+        for (const int64_t size : {2'000'000, 20'000'000, 400'000'000}) {
+            Request request = To(output);
+            request.maxSize = size;
+            const Request fitted = FitIntoSize(request, Source());
+            const double bits = 60.0 * (fitted.videoRate.value_or(0) + fitted.audioRate.value_or(0));
+            EXPECT_LT(bits, static_cast<double>(size) * 8) << output;
+            EXPECT_EQ(fitted.videoRate.has_value(), output != "o.mp3");
+            EXPECT_EQ(fitted.videoMaxRate, fitted.videoRate);
+            // Where there is little for each pixel, there are fewer of them.
+            EXPECT_EQ(fitted.size.has_value(), output != "o.mp3" && size < 400'000'000) << output << size;
+            EXPECT_NE(TellSize(fitted), "");
+        }
+    }
+    Request little = To("o.mp4");
+    little.maxSize = 100'000;
+    EXPECT_TRUE(Refused([&] { FitIntoSize(little, Source()); }));
+    Request unknown = To("o.mp4");
+    unknown.maxSize = 20'000'000;
+    SourceInfo pipe = Source();
+    pipe.certainty = Certainty::kGuessed;
+    EXPECT_EQ(Refused([&] { FitIntoSize(unknown, pipe); }),
+              std::pair(Category::kRequest, Reason::kUnknownLength));
+    EXPECT_EQ(FitIntoSize(To("o.mp4"), Source()).videoRate, std::nullopt);
+}
+
+} // namespace
