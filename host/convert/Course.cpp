@@ -35,6 +35,14 @@ bool HasShrunk(const SourceInfo& source) {
     return !unknown && static_cast<int64_t>(bytes) < source.bytes;
 }
 
+std::string TellCrop(const PictureStreamInfo& pictures) {
+    const Crop& crop = pictures.crop;
+    if (crop.CutsNothing())
+        return "no black borders were found";
+    return fmt::format("the pictures are cropped to {}x{}: {} above, {} below, {} left, {} right",
+                       pictures.width, pictures.height, crop.top, crop.bottom, crop.left, crop.right);
+}
+
 WorkClock::Time Now() {
     return std::chrono::steady_clock::now();
 }
@@ -65,6 +73,8 @@ Verdict Course::Run() {
         observer_.LeftBehind(left);
     if (request_.maxSize)
         observer_.Warned({Warning::Kind::kChosen, TellSize(request_)});
+    if (request_.detectCrop && movie_.Info().pictures)
+        observer_.Warned({Warning::Kind::kChosen, TellCrop(*movie_.Info().pictures)});
     if ((lengthKnown || request_.length) && HasRates(request_, ChooseFormat(request_), movie_.Info()))
         WarnOfSmallRoom();
     clock_.Skip(Now());

@@ -58,7 +58,7 @@ struct Warning {
     enum class Kind {
         kSmallRoom,    ///< The output will probably not find enough room.
         kWaitsForRoom, ///< The disk is full; the conversion goes on when there is room, or ends by Stop.
-        kChosen,       ///< What was chosen to keep below Request::maxSize.
+        kChosen,       ///< What was chosen for Request::maxSize or Request::detectCrop.
         kSource,       ///< Something was wrong with the source and has been put right or skipped.
     };
     Kind kind;

@@ -66,7 +66,7 @@ private:
     // The taking thread's.
     Planes taken_;
     std::optional<PictureFilter> filter_;
-    PictureConverter converter_{0, false, false};
+    PictureConverter converter_{PictureStreamInfo{}, false};
 };
 
 } // namespace movieconv

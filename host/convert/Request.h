@@ -3,6 +3,7 @@
 #define MOVIECONV_HOST_CONVERT_REQUEST_H
 
 #include "host/convert/Preferences.h"
+#include "host/source/Crop.h"
 #include "host/source/Deinterlace.h"
 
 #include <chrono>
@@ -45,6 +46,8 @@ struct Request {
     std::optional<int32_t> channels;
     std::optional<int32_t> sampleRate; ///< Samples per second and channel.
     Deinterlace deinterlace = Deinterlace::kFlagged;
+    Crop crop{};             ///< Cut off the pictures; odd numbers are lowered by one.
+    bool detectCrop = false; ///< Cut off what is black all over the movie, instead.
     Hdr hdr = Hdr::kAuto;
     /// Bits of a picture's components, 8 or 10; by default the source's, as far as the codec has them.
     std::optional<int> depth;

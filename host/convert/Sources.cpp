@@ -3,6 +3,7 @@
 #include "host/convert/CodecPlan.h"
 #include "host/convert/EncodePlan.h"
 #include "host/convert/Failure.h"
+#include "host/source/CropDetection.h"
 
 #include <utility>
 
@@ -16,9 +17,20 @@ SourceChoice ChoiceOf(const Request& request) {
             .playlists = request.playlists};
 }
 
-/// With the pictures as the output takes them.
-SourceChoice ChoiceForOutput(const Request& request) {
+/// ChoiceOf with what is to be cropped. Throws SourceError.
+SourceChoice CroppedChoiceOf(const Request& request, const std::shared_ptr<Interruption>& interruption) {
     SourceChoice choice = ChoiceOf(request);
+    choice.crop = request.crop;
+    if (request.detectCrop && choice.pictures) {
+        Source source(request.input, {.playlists = choice.playlists}, interruption);
+        choice.crop = FindBorders(source).value_or(Crop{});
+    }
+    return choice;
+}
+
+/// With the pictures as the output takes them.
+SourceChoice ChoiceForOutput(const Request& request, const std::shared_ptr<Interruption>& interruption) {
+    SourceChoice choice = CroppedChoiceOf(request, interruption);
     if (request.output.empty())
         return choice;
     choice.deep = MostDepth(request, ChooseFormat(request)) > 8;
@@ -33,6 +45,8 @@ auto Opened(Open open) {
         return open();
     } catch (const PlaylistError& error) {
         throw Failure(Category::kSource, error.what(), Reason::kPlaylist);
+    } catch (const CropError& error) {
+        throw Failure(Category::kRequest, error.what());
     } catch (const SourceError& error) {
         throw Failure(Category::kSource, error.what());
     }
@@ -41,11 +55,11 @@ auto Opened(Open open) {
 } // namespace
 
 Movie OpenMovie(const Request& request, std::shared_ptr<Interruption> interruption) {
-    return Opened([&] { return Movie(request.input, ChoiceForOutput(request), std::move(interruption)); });
+    return Opened([&] { return Movie(request.input, ChoiceForOutput(request, interruption), interruption); });
 }
 
 SourceInfo LookAtSource(const Request& request) {
-    return Opened([&] { return Source(request.input, ChoiceOf(request)).Info(); });
+    return Opened([&] { return Source(request.input, CroppedChoiceOf(request, nullptr)).Info(); });
 }
 
 } // namespace movieconv

@@ -89,6 +89,23 @@ std::optional<Size> ParseSize(std::string_view text) {
     return Size{static_cast<int32_t>(width), static_cast<int32_t>(height)};
 }
 
+std::optional<Crop> ParseCrop(std::string_view text) {
+    constexpr int kMost = 32768;
+    Crop crop;
+    for (int* edge : {&crop.top, &crop.bottom, &crop.left, &crop.right}) {
+        const std::string_view part = text.substr(0, text.find(':'));
+        const auto pixels = ParseNumber(part);
+        if (!IsDigits(part) || !pixels || *pixels > kMost)
+            return std::nullopt;
+        *edge = static_cast<int>(*pixels);
+        const bool isLast = edge == &crop.right;
+        if (isLast != (part.size() == text.size()))
+            return std::nullopt;
+        text.remove_prefix(isLast ? part.size() : part.size() + 1);
+    }
+    return crop;
+}
+
 std::optional<double> ParseFrameRate(std::string_view text) {
     const std::size_t slash = text.find('/');
     const auto number = ParseNumber(text.substr(0, slash));

@@ -3,6 +3,7 @@
 #define MOVIECONV_HOST_PRESETS_NOTATION_H
 
 #include "host/convert/Preferences.h"
+#include "host/convert/Request.h"
 
 #include <cstdint>
 #include <optional>
@@ -24,6 +25,9 @@ std::optional<Size> ParseSize(std::string_view text);
 
 /// Pictures per second from "25", "23.976" or "30000/1001", up to 200. Nothing for anything else.
 std::optional<double> ParseFrameRate(std::string_view text);
+
+/// From "T:B:L:R", each up to 32768. Nothing for anything else.
+std::optional<Crop> ParseCrop(std::string_view text);
 
 } // namespace movieconv
 

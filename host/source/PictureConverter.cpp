@@ -88,7 +88,22 @@ av::Frame PictureConverter::Convert(AVFrame& picture) {
         converted = Scale(picture);
     }
     const bool upright = quarterTurns_ == 0 && !mirrored_;
-    return converted && !upright ? Turn(*converted) : std::move(converted);
+    if (converted && !upright)
+        converted = Turn(*converted);
+    if (converted && !crop_.CutsNothing())
+        Cut(*converted);
+    return converted;
+}
+
+/// Moves the edges, not the pixels. A picture that has become too small for it on the way stays whole.
+void PictureConverter::Cut(AVFrame& picture) const {
+    if (picture.width <= crop_.left + crop_.right || picture.height <= crop_.top + crop_.bottom)
+        return;
+    picture.crop_top = static_cast<size_t>(crop_.top);
+    picture.crop_bottom = static_cast<size_t>(crop_.bottom);
+    picture.crop_left = static_cast<size_t>(crop_.left);
+    picture.crop_right = static_cast<size_t>(crop_.right);
+    av_frame_apply_cropping(&picture, AV_FRAME_CROP_UNALIGNED);
 }
 
 av::Frame PictureConverter::Scale(const AVFrame& picture) {

@@ -4,16 +4,17 @@
 #define MOVIECONV_HOST_SOURCE_PICTURECONVERTER_H
 
 #include "ffmpeg/AvHandles.h"
+#include "host/source/SourceInfo.h"
 
 namespace movieconv {
 
 class PictureConverter {
 public:
-    /// Pictures are mirrored left to right if asked for and then turned clockwise by so many times 90
-    /// degrees. `deep`: they get 10 bits.
-    PictureConverter(int quarterTurns, bool mirrored, bool deep)
-        : quarterTurns_(quarterTurns),
-          mirrored_(mirrored),
+    /// Pictures of such a stream are mirrored, turned and cropped as it says. `deep`: they get 10 bits.
+    PictureConverter(const PictureStreamInfo& stream, bool deep)
+        : quarterTurns_(stream.quarterTurns),
+          mirrored_(stream.mirrored),
+          crop_(stream.crop),
           format_(deep ? AV_PIX_FMT_YUV420P10 : AV_PIX_FMT_YUV420P) {}
 
     /// The picture in the engine's form. One that has it already is passed on without a copy. Null when it
@@ -23,9 +24,11 @@ public:
 private:
     av::Frame Scale(const AVFrame& picture);
     av::Frame Turn(const AVFrame& picture) const;
+    void Cut(AVFrame& picture) const;
 
     const int quarterTurns_;
     const bool mirrored_;
+    const Crop crop_;
     const AVPixelFormat format_;
     av::Scaler scaler_;
 };

@@ -4,17 +4,15 @@
 #define MOVIECONV_HOST_SOURCE_PICTUREFILTER_H
 
 #include "ffmpeg/AvHandles.h"
+#include "ffmpeg/FilterGraph.h"
 #include "host/source/Deinterlace.h"
 #include "host/source/SourceInfo.h"
 
 #include <cstdint>
 #include <deque>
 #include <functional>
-#include <memory>
 #include <optional>
-
-struct AVFilterGraph;
-struct AVFilterContext;
+#include <string>
 
 namespace movieconv {
 
@@ -26,7 +24,6 @@ public:
     using Sink = std::function<bool(AVFrame& picture, std::optional<int64_t> stamp)>;
 
     PictureFilter(const PictureStreamInfo& pictures, const SourceChoice& choice);
-    ~PictureFilter();
 
     /// False when the sink wanted no more. Throws SourceError when the pictures cannot be filtered.
     bool Push(AVFrame& picture, std::optional<int64_t> stamp, const Sink& sink);
@@ -38,22 +35,14 @@ public:
     bool Deinterlaced() const { return deinterlaced_; }
 
 private:
-    struct GraphFree {
-        void operator()(AVFilterGraph* graph) const;
-    };
-
-    bool Fits(const AVFrame& picture) const;
-    void Build(const AVFrame& picture);
+    std::string Chain() const;
     bool HandOut(const Sink& sink);
 
     const Deinterlace deinterlace_;
     const bool deep_;
     const int transfer_; // of HDR that becomes SDR; 0: none does
     bool deinterlaced_ = false;
-    std::unique_ptr<AVFilterGraph, GraphFree> graph_;
-    AVFilterContext* entry_ = nullptr; // the graph's
-    AVFilterContext* exit_ = nullptr;
-    av::Frame form_; // size and format that the graph is made for
+    std::optional<av::FilterGraph> graph_;
     int64_t count_ = 0;
     std::deque<std::optional<int64_t>> stamps_; // of the pictures in the graph
 };

@@ -46,6 +46,24 @@ Source::Source(const std::string& path, const SourceChoice& choice,
         throw SourceError(NothingToConvert(path, choice));
     reader_.Select(std::move(selected));
     Probe();
+    if (info_.pictures)
+        CropPictures(choice.crop);
+}
+
+/// The pictures' shape is that of what is left. Throws CropError when that is too little.
+void Source::CropPictures(const Crop& crop) {
+    constexpr int kLeast = 16; // pixels
+    PictureStreamInfo& pictures = *info_.pictures;
+    const auto even = [](int pixels) { return pixels & ~1; };
+    pictures.crop = {even(crop.top), even(crop.bottom), even(crop.left), even(crop.right)};
+    const int width = pictures.width - pictures.crop.left - pictures.crop.right;
+    const int height = pictures.height - pictures.crop.top - pictures.crop.bottom;
+    if (!crop.CutsNothing() && (width < kLeast || height < kLeast)) {
+        throw CropError(fmt::format("too little is left of the pictures of \"{}\", which are {}x{}",
+                                    info_.path, pictures.width, pictures.height));
+    }
+    pictures.width = width;
+    pictures.height = height;
 }
 
 /// Finds out what only reading tells, for the chosen streams.

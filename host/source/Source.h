@@ -34,6 +34,7 @@ public:
 
 private:
     void Probe();
+    void CropPictures(const Crop& crop);
     StreamInfo& StreamOf(int index);
 
     MovieReader reader_;

@@ -3,6 +3,7 @@
 #define MOVIECONV_HOST_SOURCE_SOURCEINFO_H
 
 #include "host/source/Completeness.h"
+#include "host/source/Crop.h"
 #include "host/source/Deinterlace.h"
 
 #include <cstdint>
@@ -46,7 +47,7 @@ struct PictureStreamInfo {
     std::string codec;       ///< Codec name, "h264".
     std::string pixelFormat; ///< FFmpeg's name, "yuv420p".
     int depth = 8;           ///< Bits of a component.
-    int width = 0;           ///< As shown, after rotation.
+    int width = 0;           ///< As shown, after rotation and cropping.
     int height = 0;
     int quarterTurns = 0;  ///< Clockwise turns by 90 degrees that bring the stored picture upright.
     bool mirrored = false; ///< The stored picture is mirrored left to right before it is turned.
@@ -64,6 +65,7 @@ struct PictureStreamInfo {
     std::optional<MasteringDisplay> masteringDisplay;
     std::optional<LightLevel> lightLevel;
     bool dolbyVision = false;
+    Crop crop{}; ///< What is cut off; even numbers.
 };
 
 /// Whether the pictures are made for more light and colour than usual displays have.
@@ -144,6 +146,7 @@ struct SourceChoice {
     bool sound = true;    ///< Look for sound at all.
     Deinterlace deinterlace = Deinterlace::kFlagged;
     bool deep = false;      ///< Pictures of more than 8 bits are handed out with 10; otherwise with 8.
+    Crop crop{};            ///< Cut off the pictures; odd numbers are lowered by one.
     bool keepHdr = false;   ///< HDR pictures are handed out as they are; otherwise as BT.709.
     bool playlists = false; ///< Also open what names other movies, in its own folder and below.
 };

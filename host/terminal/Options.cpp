@@ -86,6 +86,21 @@ void AddEncoding(CLI::App& app, Options& options) {
     app.add_flag("--no-audio", options.request.noAudio, "Leave the sound out")->group(group);
 }
 
+CLI::Option* AddCrop(CLI::App& app, Options& options) {
+    const auto take = [&options](const std::string& text) {
+        options.request.detectCrop = text == "auto";
+        const std::optional<Crop> crop = options.request.detectCrop ? std::optional(Crop{}) : ParseCrop(text);
+        if (!crop)
+            throw CLI::ValidationError("--crop",
+                                       fmt::format("\"{}\" is not auto or pixels such as 140:140:0:0", text));
+        options.request.crop = *crop;
+    };
+    return app
+        .add_option_function<std::string>(
+            "--crop", take, "Cut off so many pixels above, below, left and right,\nor black borders (auto)")
+        ->type_name("T:B:L:R");
+}
+
 void AddPictures(CLI::App& app, Options& options) {
     const std::string group = "Pictures";
     AddParsed(app, "--size", ParseSize, options.request.size,
@@ -101,6 +116,7 @@ void AddPictures(CLI::App& app, Options& options) {
         {{"all", Deinterlace::kAll}, {"auto", Deinterlace::kFlagged}, {"off", Deinterlace::kNone}},
         "Make pictures progressive that say they are interlaced\n(auto, the default), all or none")
         ->group(group);
+    AddCrop(app, options)->group(group);
     AddChoice<Hdr>(app, "--hdr", options.request.hdr,
                    {{"auto", Hdr::kAuto}, {"keep", Hdr::kKeep}, {"sdr", Hdr::kSdr}},
                    "Keep HDR, make SDR of it, or keep it where the codec\nhas 10 bits (auto, the default)")

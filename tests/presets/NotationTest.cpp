@@ -26,6 +26,11 @@ TEST(Notation, ReadRatesSizesAndFrameRates) {
     EXPECT_EQ(ParseSize("640x360")->height, 360);
     for (const char* text : {"640", "x360", "640x", "1x1", "640x360x2", "99999x2", "-4x4"})
         EXPECT_FALSE(ParseSize(text)) << text;
+    EXPECT_EQ(ParseCrop("140:138:0:2")->bottom, 138);
+    EXPECT_EQ(ParseCrop("140:138:0:2")->right, 2);
+    for (const char* text :
+         {"", "1:2:3", "1:2:3:", "1:2:3:4:", "1:2:3:4:5", "-1:2:3:4", "1:a:3:4", "1:2:3:99999"})
+        EXPECT_FALSE(ParseCrop(text)) << text;
     EXPECT_DOUBLE_EQ(*ParseFrameRate("30000/1001"), 30000.0 / 1001);
     for (const char* text : {"0", "25/0", "1000", "/5", "a"})
         EXPECT_EQ(ParseFrameRate(text), std::nullopt) << text;

@@ -1,4 +1,5 @@
-// Interlaced and HDR pictures, measured where they are handed to the engine.
+// Interlaced, HDR and bordered pictures, measured where they are handed to the engine.
+#include "host/source/CropDetection.h"
 #include "host/source/Movie.h"
 #include "tests/support/TestMovies.h"
 
@@ -99,6 +100,55 @@ TEST(Filters, BringHdrToTheLightOfUsualDisplays) {
             EXPECT_NEAR(image->pV[16 * image->nPitchV + x], 128, 2) << x;
         }
     }
+}
+
+/// A movie whose second half only shows all of the picture between the borders.
+std::string Letterboxed() {
+    return Make(
+        "letterboxed.mkv",
+        {"-f", "lavfi", "-i",
+         "color=black:s=320x240:r=25:d=8,format=yuv420p,geq=lum='if(between(Y,36,199)*between(X,10,299)*"
+         "gte(N,if(lt(X,150),20,120)),60+mod(X+Y,120),16)':cb=128:cr=128",
+         "-c:v", "libx264", "-g", "10", "-qp", "10"});
+}
+
+TEST(Borders, AreFoundAllOverTheMovieUpright) {
+    const std::string turned =
+        Make("letterboxed-turned.mp4", {"-i", Letterboxed(), "-metadata:s:v", "rotate=90", "-c", "copy"});
+    const std::string black = Make("black.mkv", {"-f", "lavfi", "-i", "color=black:s=64x64:d=1"});
+    const auto find = [](const std::string& path) {
+        movieconv::Source source(path, {});
+        return movieconv::FindBorders(source);
+    };
+    const auto crop = find(Letterboxed());
+    ASSERT_TRUE(crop);
+    EXPECT_EQ(crop->top, 36);
+    EXPECT_EQ(crop->bottom, 40);
+    EXPECT_EQ(crop->left, 10);
+    EXPECT_EQ(crop->right, 20);
+    const auto onSide = find(turned);
+    ASSERT_TRUE(onSide);
+    Movie movie(turned, {.crop = *onSide});
+    const VideoImage* image = movie.Pictures()->GetCurrentImage();
+    ASSERT_NE(image, nullptr);
+    EXPECT_EQ(image->nWidth, 164);
+    EXPECT_EQ(image->nHeight, 290);
+    EXPECT_FALSE(find(black));
+}
+
+TEST(Borders, AreCutOffWhereTheyWereTold) {
+    Movie movie(Letterboxed(), {.crop = {.top = 37, .bottom = 40, .left = 10, .right = 20}});
+    EXPECT_EQ(movie.Info().pictures->width, 290);
+    EXPECT_EQ(movie.Info().pictures->height, 164);
+    movie.Pictures()->Seek(5, 1);
+    const VideoImage* image = movie.Pictures()->GetCurrentImage();
+    ASSERT_NE(image, nullptr);
+    EXPECT_EQ(image->nWidth, 290);
+    EXPECT_EQ(image->nHeight, 164);
+    for (const int y : {0, 163})
+        for (const int x : {0, 100, 289})
+            EXPECT_NEAR(image->pY[y * image->nPitchY + x], 60 + (x + 10 + y + 36) % 120, 6) << x << ", " << y;
+    EXPECT_THROW(Movie(Letterboxed(), {.crop = {.top = 120, .bottom = 110}}), movieconv::CropError);
 }
 
 } // namespace

@@ -278,6 +278,33 @@ TEST(Program, PrintsValidJsonAndNothingElse) {
     EXPECT_NE(ReadFile(folder / "log").find("Encoding thread Exit."), std::string::npos);
 }
 
+TEST(Program, CropsWhatItIsToldOrFinds) {
+    const std::string source =
+        Make("bordered.mkv",
+             {"-f", "lavfi", "-i", "testsrc2=s=320x160:d=1,pad=320:240:0:40", "-c:v", "mpeg4", "-q:v", "2"});
+    const Folder folder;
+    const struct {
+        const char* crop;
+        int width;
+        int height;
+        const char* says;
+    } cases[] = {{"auto", 320, 160, "cropped to 320x160: 40 above, 40 below, 0 left, 0 right"},
+                 {"21:30:40:51", 230, 190, "done"}};
+    for (const auto& test : cases) {
+        const Result result = Call({"-y", "--crop", test.crop, source, folder / "o.mkv"});
+        EXPECT_EQ(result.code, 0) << result.err;
+        EXPECT_NE((result.out + result.err).find(test.says), std::string::npos) << result.out << result.err;
+        const movieconv::Movie movie(folder / "o.mkv", {});
+        EXPECT_EQ(movie.Info().pictures->width, test.width);
+        EXPECT_EQ(movie.Info().pictures->height, test.height);
+    }
+    const Result plain = Call({"-y", "--crop", "auto", Counted(), folder / "o.mkv"});
+    EXPECT_NE(plain.err.find("no black borders"), std::string::npos) << plain.err;
+    const Result tooMuch = Call({"-y", "--crop", "120:110:0:0", source, folder / "o.mkv"});
+    EXPECT_EQ(tooMuch.code, 2);
+    EXPECT_NE(tooMuch.err.find("too little is left"), std::string::npos) << tooMuch.err;
+}
+
 TEST(Program, KeepsAPreview) {
     const Folder folder;
     for (const Args& options : {Args{}, Args{"--no-audio"}, Args{"--length", "0.5"}}) {

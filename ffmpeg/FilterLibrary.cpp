@@ -1,6 +1,4 @@
-#include "host/source/FilterLibrary.h"
-
-#include "host/source/SourceError.h"
+#include "ffmpeg/FilterLibrary.h"
 
 #include <dlfcn.h>
 #include <string>
@@ -10,7 +8,7 @@ extern "C" {
 #include <libavutil/macros.h>
 }
 
-namespace movieconv {
+namespace av {
 namespace {
 
 constexpr char kName[] = "libavfilter.so." AV_STRINGIFY(LIBAVFILTER_VERSION_MAJOR);
@@ -22,7 +20,7 @@ FilterLibrary Load() {
                        ? reinterpret_cast<std::decay_t<decltype(function)>>(dlsym(library, name))
                        : nullptr;
         if (function == nullptr)
-            throw SourceError(std::string("its pictures need filters, but ") + kName + " cannot be loaded");
+            throw FilterError(std::string(kName) + " cannot be loaded");
     };
     FilterLibrary filters{};
     find(filters.avfilter_get_by_name, "avfilter_get_by_name");
@@ -45,4 +43,4 @@ const FilterLibrary& Filters() {
     return filters;
 }
 
-} // namespace movieconv
+} // namespace av

@@ -1,9 +1,10 @@
 // FFmpeg's filters, loaded when the first picture needs one: with what they depend on, they cost memory and
 // time at every start.
-#ifndef MOVIECONV_HOST_SOURCE_FILTERLIBRARY_H
-#define MOVIECONV_HOST_SOURCE_FILTERLIBRARY_H
+#ifndef MOVIECONV_FFMPEG_FILTERLIBRARY_H
+#define MOVIECONV_FFMPEG_FILTERLIBRARY_H
 
 #include <cstdint> // for FFmpeg's headers
+#include <stdexcept>
 
 extern "C" {
 #include <libavfilter/avfilter.h>
@@ -11,7 +12,13 @@ extern "C" {
 #include <libavfilter/buffersrc.h>
 }
 
-namespace movieconv {
+namespace av {
+
+/// Why pictures cannot be filtered.
+class FilterError : public std::runtime_error {
+public:
+    using std::runtime_error::runtime_error;
+};
 
 /// The library's functions under its own names.
 struct FilterLibrary {
@@ -27,10 +34,10 @@ struct FilterLibrary {
     decltype(&::av_buffersrc_add_frame) av_buffersrc_add_frame;
 };
 
-/// Loads it at the first call, for the rest of the process. Any thread. Throws SourceError when it is
+/// Loads it at the first call, for the rest of the process. Any thread. Throws FilterError when it is
 /// missing.
 const FilterLibrary& Filters();
 
-} // namespace movieconv
+} // namespace av
 
 #endif
