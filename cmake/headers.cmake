@@ -13,6 +13,7 @@ set(public_headers
   host/convert/Failure.h
   host/convert/Formats.h
   host/convert/Job.h
+  host/convert/LogTap.h
   host/convert/Observer.h
   host/convert/Preferences.h
   host/convert/Request.h

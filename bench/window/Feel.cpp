@@ -3,7 +3,6 @@
 // time that all conversions took, and the memory. PICTURES 0 minimises the window.
 #include "host/window/App.h"
 #include "host/window/runner/ConvertRunner.h"
-#include "logsink/LogSink.h"
 
 #include <QApplication>
 #include <QElapsedTimer>
@@ -75,7 +74,6 @@ int main(int argc, char** argv) {
     const std::string movie = std::filesystem::absolute(argv[1]).string();
     const int copies = argc > 2 ? std::stoi(argv[2]) : 8;
     const bool pictures = argc < 4 || std::stoi(argv[3]) != 0;
-    LogSinkSetFile("");
     QElapsedTimer sinceStart;
     sinceStart.start();
     Watched application(argc, argv);

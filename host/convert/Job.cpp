@@ -6,9 +6,11 @@
 #include "host/convert/OutputCheck.h"
 #include "host/convert/Sources.h"
 
+#include <algorithm>
 #include <condition_variable>
 #include <mutex>
 #include <new>
+#include <sys/resource.h>
 #include <thread>
 #include <utility>
 
@@ -21,6 +23,13 @@ Failure Unexpected(const std::exception& error) noexcept {
     } catch (const std::bad_alloc&) {
         return {Category::kInternal, {}, Reason::kNoMemory};
     }
+}
+
+/// For the calling thread, and so for all that it is going to make.
+void StandBack(int niceness) {
+    constexpr int kMost = 19;
+    if (niceness > 0) // a refusal leaves it as it is
+        setpriority(PRIO_PROCESS, 0, std::min(getpriority(PRIO_PROCESS, 0) + niceness, kMost));
 }
 
 } // namespace
@@ -77,6 +86,7 @@ private:
 };
 
 void Job::Impl::Run() noexcept {
+    StandBack(request_.niceness);
     Verdict verdict;
     try {
         verdict = Convert();

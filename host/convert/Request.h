@@ -66,6 +66,8 @@ struct Request {
     OnFull onFull = OnFull::kStop;
     bool keepPartial = true; ///< Whether the temporary file of a conversion that failed stays; it plays.
 
+    /// How far all threads of the conversion stand back behind what else the machine does, 0 to 19.
+    int niceness = 0;
     int encoderThreads = 0; ///< Of the picture encoder; 0 leaves it to the writer.
     bool bitExact = false;  ///< Nothing in the file tells time, date or library version.
 

@@ -1,6 +1,5 @@
 #include "host/window/App.h"
 #include "host/window/runner/ConvertRunner.h"
-#include "logsink/LogSink.h"
 
 #include <QApplication>
 #include <QIcon>
@@ -72,7 +71,6 @@ int main(int argc, char** argv) {
         std::puts("Usage: movieconv-gui [MOVIE|FOLDER]...\nOpens the window with these movies in its queue.");
         return 0;
     }
-    LogSinkSetFile("");      // the engine's trace is for those who write programs
     mallopt(M_ARENA_MAX, 2); // heaps of their own for dozens of threads cost memory and save no time
     QApplication application(argc, argv);
     QApplication::setApplicationName(QStringLiteral("movieconv"));

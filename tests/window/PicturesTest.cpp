@@ -158,3 +158,20 @@ TEST_F(PicturesTest, TellsWhatGoesWrongInWords) {
     EXPECT_EQ(At(0).state, State::kFailed);
     EXPECT_GT(std::filesystem::file_size(movie), 10'000U);
 }
+
+TEST_F(PicturesTest, KeepsWhatTheDecoderSaysInTheLogOfTheMovie) {
+    std::string movie = ReadFile(Holiday());
+    for (size_t at = movie.size() / 3; at < movie.size() / 3 + 20'000; ++at)
+        movie[at] = static_cast<char>(movie[at] ^ 0x55);
+    WriteFile(folder / "scratched.mkv", movie);
+    app.TheQueue().SetNaming({QStringLiteral("{name}"), folder.Path()});
+    app.TheQueue().Add({folder / "scratched.mkv"});
+    AwaitExamined(1);
+    testing::internal::CaptureStderr();
+    app.TheDispatcher().Start();
+    ASSERT_TRUE(AwaitDone());
+    EXPECT_EQ(testing::internal::GetCapturedStderr(), "");
+    EXPECT_FALSE(At(0).notes.filter(QStringLiteral(" @ 0x")).isEmpty())
+        << "no line of a decoder's in\n"
+        << At(0).notes.join(QLatin1Char('\n')).toStdString();
+}

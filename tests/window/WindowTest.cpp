@@ -283,11 +283,12 @@ TEST_F(WindowTest, ConvertsWithALivePicture) {
 }
 
 TEST_F(WindowTest, OpensWhatWasConverted) {
-    Add({"a.mkv"});
+    // What the program does with them is the desktop's.
+    QObject::disconnect(&Window(), &MainWindow::FileWanted, nullptr, nullptr);
+    QObject::disconnect(&Window(), &MainWindow::FolderWanted, nullptr, nullptr);
     QSignalSpy files(&Window(), &MainWindow::FileWanted);
     QSignalSpy folders(&Window(), &MainWindow::FolderWanted);
-    QObject::disconnect(&Window(), &MainWindow::FileWanted, nullptr, nullptr);
-    files.clear();
+    Add({"a.mkv"});
     Act("start");
     ASSERT_TRUE(AwaitScripts(1));
     Outcome outcome;
@@ -298,6 +299,13 @@ TEST_F(WindowTest, OpensWhatWasConverted) {
     ASSERT_TRUE(Await([&] { return Shows<OverPage>(); }));
     EXPECT_TRUE(Named<QLabel>("What was not carried over")->text().contains(QStringLiteral("cover")));
     EXPECT_EQ(The<QueueView>()->SelectedIds().size(), 1);
+    Click("Play the movie");
+    Act("play");
+    Click("Show in folder");
+    Act("folder");
+    const QList<QVariant> wanted{QString::fromStdString(folder / "a.mp4")};
+    EXPECT_EQ(QList<QList<QVariant>>(files), QList({wanted, wanted}));
+    EXPECT_EQ(QList<QList<QVariant>>(folders), QList({wanted, wanted}));
     Act("again");
     EXPECT_EQ(At(0).state, State::kWaiting);
     EXPECT_TRUE(At(0).outcome.files.empty());

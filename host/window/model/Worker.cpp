@@ -1,6 +1,7 @@
 #include "host/window/model/Worker.h"
 
 #include <algorithm>
+#include <sys/resource.h>
 
 namespace movieconv::window {
 
@@ -32,6 +33,8 @@ void Worker::Forget() {
 }
 
 void Worker::Run() {
+    constexpr int kNiceness = 5; // behind the window, before conversions
+    setpriority(PRIO_PROCESS, 0, kNiceness);
     std::unique_lock lock(mutex_);
     while (true) {
         changed_.wait(lock, [&] { return !tasks_.empty() || ending_; });

@@ -246,6 +246,7 @@ std::string ConvertRunner::PresetFolder() {
 }
 
 std::unique_ptr<Run> ConvertRunner::Start(const Order& order, std::shared_ptr<RunListener> listener) {
+    log_.Add(listener);
     try {
         auto run = std::make_unique<ConvertRun>(order, ToRequest(order), listener, remover_);
         run->Begin();

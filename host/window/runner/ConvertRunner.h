@@ -4,6 +4,7 @@
 
 #include "host/window/model/Runner.h"
 #include "host/window/model/Worker.h"
+#include "host/window/runner/LogShare.h"
 
 namespace movieconv::window {
 
@@ -21,6 +22,7 @@ public:
     QImage PictureAt(const std::string& path, double seconds, int width) override;
 
 private:
+    LogShare log_;
     Worker remover_; // frees what a conversion leaves, which may take longer than the window can wait
 };
 

@@ -11,7 +11,8 @@
 namespace movieconv::window {
 namespace {
 
-constexpr int kMiddle = 50; // of the window's scale of quality
+constexpr int kNiceness = 10; // lest the window waits for a processor
+constexpr int kMiddle = 50;   // of the window's scale of quality
 
 Size ScaledTo(int height, const MovieFacts& facts) {
     const int even = height / 2 * 2;
@@ -60,6 +61,7 @@ Request ToRequest(const Order& order) {
     request.preferences = preset.preferences;
     request.overwrite = order.replace;
     request.onFull = OnFull::kWait;
+    request.niceness = kNiceness;
     request.begin = wishes.begin;
     if (wishes.end)
         request.length = *wishes.end - wishes.begin;

@@ -83,6 +83,13 @@
     </message>
 </context>
 <context>
+    <name>LogShare</name>
+    <message>
+        <source>There is more, which is left out.</source>
+        <translation>Es gibt mehr, was weggelassen ist.</translation>
+    </message>
+</context>
+<context>
     <name>Presets</name>
     <message>
         <source>Standard</source>
