@@ -57,6 +57,10 @@ const FileFormatInfo* FindFormatOfFile(std::string_view path) {
     return FindIf([&](const FileFormatInfo& format) { return HasExtension(format, name.substr(dot + 1)); });
 }
 
+bool HoldsSeveralTracks(const FileFormatInfo& format) {
+    return (MWGetFormatTraits(format.fccFormat) & kWriterFormatTracks) != 0;
+}
+
 std::optional<uint32_t> ParseCode(std::string_view text) {
     if (text.empty() || text.size() > 4)
         return std::nullopt;

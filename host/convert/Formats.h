@@ -17,6 +17,9 @@ const FileFormatInfo* FindFormat(std::string_view name);
 /// The format that the extension of a file name stands for. Null when it has none or an unknown one.
 const FileFormatInfo* FindFormatOfFile(std::string_view path);
 
+/// Whether files of the format hold several tracks of sound.
+bool HoldsSeveralTracks(const FileFormatInfo& format);
+
 /// "H264" from "h264", "AAC " from "aac". Nothing for more than four characters or none.
 std::optional<uint32_t> ParseCode(std::string_view text);
 

@@ -100,6 +100,7 @@ TEST_F(RunnerTest, AsksTheLibraryForWhatIsWished) {
     wishes.quality = 10;
     wishes.height = 360;
     wishes.deinterlace = Wishes::Deinterlace::kOff;
+    wishes.crop = true;
     wishes.begin = 5;
     wishes.end = 7;
     request = ToRequest(OrderOf(wishes, "out.webm"));
@@ -108,6 +109,7 @@ TEST_F(RunnerTest, AsksTheLibraryForWhatIsWished) {
     EXPECT_EQ(request.size->width, 640);
     EXPECT_EQ(request.size->height, 360);
     EXPECT_EQ(request.deinterlace, movieconv::Deinterlace::kNone);
+    EXPECT_TRUE(request.detectCrop);
     EXPECT_EQ(request.length, 2);
     EXPECT_LT(EstimatedRate(OrderOf(wishes, "out.webm"), request), usual);
 

@@ -37,7 +37,7 @@ struct MovieFacts {
     std::vector<TrackFacts> sounds;
     std::vector<TrackFacts> subtitles;
     int chapters = 0;
-    QStringList leftBehind; ///< What a conversion cannot carry over, a line each.
+    QStringList leftBehind; ///< What no conversion carries over, a line each.
     int64_t bytes = 0;
 };
 

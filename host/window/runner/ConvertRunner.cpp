@@ -81,8 +81,7 @@ QString LineOf(const NotCarried& what) {
 /// Hears a job and tells a listener in the window's terms.
 class Interpreter : public Observer {
 public:
-    Interpreter(std::shared_ptr<RunListener> listener, QStringList leftBehind)
-        : listener_(std::move(listener)), leftBehind_(std::move(leftBehind)) {}
+    explicit Interpreter(std::shared_ptr<RunListener> listener) : listener_(std::move(listener)) {}
 
     void StopWasAskedFor() { stopping_ = true; }
 
@@ -140,9 +139,8 @@ private:
 
 class ConvertRun : public Run {
 public:
-    ConvertRun(const Order& order, const Request& request, std::shared_ptr<RunListener> listener,
-               Worker& remover)
-        : parts_(std::make_shared<Parts>(order, request, std::move(listener))), remover_(remover) {}
+    ConvertRun(const Request& request, std::shared_ptr<RunListener> listener, Worker& remover)
+        : parts_(std::make_shared<Parts>(request, std::move(listener))), remover_(remover) {}
     ~ConvertRun() override {
         remover_.Do(0, [parts = std::move(parts_)]() mutable { parts.reset(); });
     }
@@ -172,8 +170,8 @@ public:
 
 private:
     struct Parts {
-        Parts(const Order& order, const Request& request, std::shared_ptr<RunListener> listener)
-            : interpreter(std::move(listener), order.facts.leftBehind), job(request, interpreter) {}
+        Parts(const Request& request, std::shared_ptr<RunListener> listener)
+            : interpreter(std::move(listener)), job(request, interpreter) {}
         Interpreter interpreter;
         Job job;
     };
@@ -193,16 +191,22 @@ TrackFacts TrackOf(const StreamInfo& stream) {
     return track;
 }
 
-/// The streams of which a conversion takes one alone, a line for each of the others.
+/// The pictures beside those that a conversion takes, a line each.
 QStringList LeftBehind(const SourceInfo& info) {
     QStringList left;
-    for (const StreamInfo& stream : info.streams) {
-        const QString line = TrackLine(TrackOf(stream));
+    for (const StreamInfo& stream : info.streams)
         if (stream.kind == StreamKind::kPictures && info.pictures && stream.index != info.pictures->index)
-            left += Texts::tr("Pictures: %1").arg(line);
-        else if (stream.kind == StreamKind::kSound && info.sound && stream.index != info.sound->index)
-            left += Texts::tr("Sound track: %1").arg(line);
-    }
+            left += Texts::tr("Pictures: %1").arg(TrackLine(TrackOf(stream)));
+    return left;
+}
+
+/// What the order's file cannot hold of the movie, a line each.
+QStringList LeftBehind(const Order& order) {
+    QStringList left = order.facts.leftBehind;
+    const FileFormatInfo* format = FindFormatOfFile(order.target);
+    if (order.facts.sounds.size() > 1 && order.wishes.withSound && format != nullptr &&
+        !HoldsSeveralTracks(*format))
+        left += Texts::tr("all sound tracks but one");
     return left;
 }
 
@@ -211,6 +215,7 @@ QStringList LeftBehind(const SourceInfo& info) {
 Abilities ConvertRunner::Can() {
     Abilities abilities;
     abilities.deinterlace = true;
+    abilities.crop = true;
     abilities.presetFiles = true;
     return abilities;
 }
@@ -248,11 +253,11 @@ std::string ConvertRunner::PresetFolder() {
 std::unique_ptr<Run> ConvertRunner::Start(const Order& order, std::shared_ptr<RunListener> listener) {
     log_.Add(listener);
     try {
-        auto run = std::make_unique<ConvertRun>(order, ToRequest(order), listener, remover_);
+        auto run = std::make_unique<ConvertRun>(ToRequest(order), listener, remover_);
         run->Begin();
         return run;
     } catch (const PresetError& error) {
-        auto run = std::make_unique<ConvertRun>(order, Request(), std::move(listener), remover_);
+        auto run = std::make_unique<ConvertRun>(Request(), std::move(listener), remover_);
         run->Fail(Category::kRequest, error.what());
         return run;
     }
@@ -301,9 +306,8 @@ Findings ConvertRunner::Check(const Order& order) {
         findings.warnings += Texts::tr("There is a file of this name already.");
     else if (findings.targetExists)
         findings.warnings += Texts::tr("The file that exists will be replaced.");
-    if (!order.facts.leftBehind.isEmpty())
-        findings.notes +=
-            Texts::tr("Not carried over: %1").arg(order.facts.leftBehind.join(QStringLiteral("; ")));
+    if (const QStringList left = LeftBehind(order); !left.isEmpty())
+        findings.notes += Texts::tr("Not carried over: %1").arg(left.join(QStringLiteral("; ")));
     if (!fs::is_directory(folder, unknown)) {
         findings.warnings += Texts::tr("There is no folder “%1”.").arg(Readable(folder));
         return findings;

@@ -43,6 +43,7 @@ void AskForPictures(Request& request, const FileFormatInfo& format, const Preset
         request.size = ScaledTo(*wishes.height, facts);
     request.frameRate = wishes.rate;
     request.deinterlace = ToLibrary(wishes.deinterlace);
+    request.detectCrop = wishes.crop;
     if (!wishes.quality)
         return;
     if (const std::optional<uint32_t> codec = CodecOf(request, format))

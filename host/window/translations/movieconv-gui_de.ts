@@ -48,12 +48,12 @@
         <translation>Bilder: %1</translation>
     </message>
     <message>
-        <source>Sound track: %1</source>
-        <translation>Tonspur: %1</translation>
-    </message>
-    <message>
         <source>Not carried over: %1</source>
         <translation>Nicht übernommen: %1</translation>
+    </message>
+    <message>
+        <source>all sound tracks but one</source>
+        <translation>alle Tonspuren außer einer</translation>
     </message>
 </context>
 <context>
