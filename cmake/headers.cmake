@@ -18,6 +18,7 @@ set(public_headers
   host/convert/Preferences.h
   host/convert/Request.h
   host/convert/Room.h
+  host/convert/Work.h
   host/source/Deinterlace.h
   logsink/LogSink.h
   media/Decoders.h

@@ -25,7 +25,8 @@ allow(writer media thread log text platform ffmpeg api/Version\\.h api/LogCallba
 allow(host/source ffmpeg media thread log text ${writer_headers})
 allow(host/convert host/source api media text Common/Image ${writer_headers})
 allow(host/presets host/convert media text)
-allow(host/terminal host/presets host/convert host/source text media ffmpeg Common/Image logsink)
+allow(host/pieces host/convert host/source api media text ${writer_headers})
+allow(host/terminal host/pieces host/presets host/convert host/source text media ffmpeg Common/Image logsink)
 allow(host/window host/presets host/convert host/source text media Common/Image logsink)
 
 set(wrong "")

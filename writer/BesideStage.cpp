@@ -95,9 +95,10 @@ BesideStage::~BesideStage() {
     Join();
 }
 
-void BesideStage::Add(const TrackPlan& plan, const Container& container, EncoderFlags flags, Muxer& muxer) {
+void BesideStage::Add(const TrackPlan& plan, const Container& container, EncoderFlags flags,
+                      PacketWriter& file) {
     std::unique_ptr<BesideTrack> writer = MakeBesideTrack(plan, container, flags);
-    const int stream = muxer.AddStream(writer->Stream());
+    const int stream = file.AddStream(writer->Stream());
     tracks_.push_back({&plan, stream, std::move(writer)});
 }
 

@@ -10,7 +10,7 @@
 #define MOVIECONV_WRITER_BESIDESTAGE_H
 
 #include "writer/FilePlan.h"
-#include "writer/Muxer.h"
+#include "writer/PacketWriter.h"
 #include "writer/StageThread.h"
 
 #include <cstdint>
@@ -61,7 +61,7 @@ public:
     ~BesideStage();
 
     /// `plan` outlives it. Throws WriterFailure.
-    void Add(const TrackPlan& plan, const Container& container, EncoderFlags flags, Muxer& muxer);
+    void Add(const TrackPlan& plan, const Container& container, EncoderFlags flags, PacketWriter& file);
 
     bool Empty() const { return tracks_.empty(); }
 

@@ -35,12 +35,13 @@ void FileFinisher::TellLengths() {
     double pictures = 0;
     double sound = 0;
     int stream = 0;
-    if (plan_.pictures)
+    if (plan_.HoldsPictures())
         pictures = part_.Streams().Stream(stream++).seconds;
     if (plan_.sound)
         sound = part_.Streams().Stream(stream).seconds;
     record_.Update([&](WriterStatus& status) {
-        status.dVideoWritten = pictures;
+        // Pieces are held against their plan, by number.
+        status.dVideoWritten = plan_.piece == kWriterPieceNone ? pictures : status.dVideoReceived;
         // Some codecs count the padding of the last frame.
         const double encoded =
             plan_.sound ? static_cast<double>(status.llSamplesWritten) / status.nSampleRate : 0.0;

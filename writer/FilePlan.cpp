@@ -145,6 +145,12 @@ PicturePlan MakePicturePlan(const EncodeParam& param, const VideoFormat& source,
     const double sourceRate = UsableRate(source.dFrameRate);
     const double rate = av_q2d(plan.settings.rate);
     plan.keepStamps = sourceRate > 0.0 && SameRate(rate, sourceRate);
+    if (options.nPiece == kWriterPiecePictures) {
+        if (options.bPieceContinues != 0)
+            plan.tickBefore = options.llPieceTick;
+        if (options.llPieceEnd >= 0)
+            plan.end = options.llPieceEnd;
+    }
     plan.pictureLength =
         std::llround(static_cast<double>(kTicksPerSecond) / (sourceRate > 0.0 ? sourceRate : rate));
     return plan;
@@ -245,6 +251,7 @@ FilePlan MakeFilePlan(const EncodeParam& param, const VideoFormat* video, const 
                             "There is nothing to write into a file of the format " + FormatText(param) + ".");
     plan.tracks = MakeTrackPlans(param, plan, extras);
     plan.bitExact = options.bBitExact != 0;
+    plan.piece = options.nPiece;
     plan.indexSize = IndexSize(plan, video, audio, options.dFileLength);
     return plan;
 }

@@ -29,6 +29,10 @@ struct PicturePlan {
     PictureClock clock;
     bool keepStamps;       ///< Every picture is shown once at its own time; otherwise a steady rate is made.
     int64_t pictureLength; ///< Usual length of a source picture in 100 ns units.
+    /// Of a piece: the tick of the picture shown before it, and when the first picture of the next piece
+    /// comes.
+    std::optional<int64_t> tickBefore;
+    std::optional<int64_t> end;
 };
 
 struct SoundPlan {
@@ -51,11 +55,17 @@ struct FilePlan {
     std::optional<SoundPlan> sound;
     std::vector<TrackPlan> tracks; ///< Those that the container carries.
     bool bitExact;
+    int piece; ///< kWriterPiece...
     /// Bytes that the index of a file of the MP4 family takes when it is as long as its source.
     int64_t indexSize;
 
     /// Whether the file grows in fragments and gets one index when it is finished.
-    bool Fragmented() const { return container->kind == ContainerKind::kFragmented; }
+    bool Fragmented() const {
+        return piece == kWriterPieceNone && container->kind == ContainerKind::kFragmented;
+    }
+
+    /// Whether it holds pictures. The rest of a movie in pieces does not, but follows their stamps.
+    bool HoldsPictures() const { return pictures && piece != kWriterPieceRest; }
 };
 
 /// Throws WriterFailure when the parameters make no sense or do not fit together. `video` and `audio` may be

@@ -33,9 +33,9 @@ av::Input OpenMovie(AvioFile& file, int kind, int flags = 0) {
 
 /// Gives `index` the streams of `written`. The packets of these codecs have been brought into the
 /// container's own form, to which the description in the file belongs and the encoder's does not.
-void AddStreams(const AVFormatContext& input, const Muxer& written, Mp4Index& index) {
+void AddStreams(const AVFormatContext& input, const PacketWriter& written, Mp4Index& index) {
     for (int stream = 0; stream < written.StreamCount(); ++stream) {
-        const Muxer::Written taken = written.Stream(stream);
+        const PacketWriter::Written taken = written.Stream(stream);
         MuxedStream description = taken.description;
         const AVCodecParameters* stored = input.streams[stream]->codecpar;
         const bool reformed = stored->codec_id == AV_CODEC_ID_H264 || stored->codec_id == AV_CODEC_ID_HEVC;
@@ -136,7 +136,7 @@ std::vector<uint8_t> ReadStart(ByteFile& file, const PlacedPacket& packet) {
 
 /// Throws WriterFailure when the index of `file` does not name all that `written` took: the multiplexer
 /// leaves out without a word what it has no memory for.
-void CheckIndex(ByteFile& file, const Muxer& written) {
+void CheckIndex(ByteFile& file, const PacketWriter& written) {
     AvioFile in(std::shared_ptr<ByteFile>(std::shared_ptr<ByteFile>(), &file), AvioFile::Mode::kRead);
     const av::Input input = OpenMovie(in, kWriterErrorEncode);
     for (int stream = 0; stream < written.StreamCount(); ++stream) {
@@ -149,9 +149,9 @@ void CheckIndex(ByteFile& file, const Muxer& written) {
 
 } // namespace
 
-void FinishFragments(const std::shared_ptr<ByteFile>& part, const Muxer& written, const Container& container,
-                     const FragmentLog& log, const Mp4Room& room, bool bitExact, const Extras& extras,
-                     const std::function<void(double)>& progress) {
+void FinishFragments(const std::shared_ptr<ByteFile>& part, const PacketWriter& written,
+                     const Container& container, const FragmentLog& log, const Mp4Room& room, bool bitExact,
+                     const Extras& extras, const std::function<void(double)>& progress) {
     // The multiplexer does not tell of data that it had no memory for.
     const int64_t end = part->Seek(0, SEEK_END);
     if (log.End() != end)

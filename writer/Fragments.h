@@ -4,7 +4,7 @@
 
 #include "writer/FragmentLog.h"
 #include "writer/Mp4Room.h"
-#include "writer/Muxer.h"
+#include "writer/PacketWriter.h"
 
 #include <functional>
 #include <memory>
@@ -16,9 +16,9 @@ namespace writer {
 /// that went into `written`. The file has to be synced afterwards. `progress` is told the share done, 0 to 1.
 /// Throws WriterFailure, with kWriterErrorFinish when `part` cannot be read or does not hold all that was
 /// written; it is the fragmented file then, as it was.
-void FinishFragments(const std::shared_ptr<ByteFile>& part, const Muxer& written, const Container& container,
-                     const FragmentLog& log, const Mp4Room& room, bool bitExact, const Extras& extras,
-                     const std::function<void(double)>& progress);
+void FinishFragments(const std::shared_ptr<ByteFile>& part, const PacketWriter& written,
+                     const Container& container, const FragmentLog& log, const Mp4Room& room, bool bitExact,
+                     const Extras& extras, const std::function<void(double)>& progress);
 
 /// How far `part`, which has `size` bytes, consists of whole fragments, whose data is exactly what their
 /// heads name. The multiplexer does not know: of data that it had no memory for it does not tell, and when it

@@ -44,24 +44,14 @@ EncoderFlags FlagsFor(const FilePlan& plan) {
     return {format != nullptr && (format->flags & AVFMT_GLOBALHEADER) != 0, plan.bitExact};
 }
 
-int AddEncoder(Muxer& muxer, const AVCodecContext& context, AVRational unit, AVRational rate, int64_t runUp,
-               const Carriage& carriage, const TrackLabel& label, const HdrLight* light = nullptr) {
+int AddEncoder(PacketWriter& file, const AVCodecContext& context, AVRational unit, AVRational rate,
+               int64_t runUp, const Carriage& carriage, const TrackLabel& label,
+               const HdrLight* light = nullptr) {
     const av::CodecParameters parameters(avcodec_parameters_alloc());
     if (!parameters || avcodec_parameters_from_context(parameters.get(), &context) < 0)
         throw std::bad_alloc();
-    return muxer.AddStream(
+    return file.AddStream(
         {parameters.get(), unit, rate, context.sample_aspect_ratio, runUp, &carriage, &label, light});
-}
-
-/// Where the file's data really goes. Throws WriterFailure when nothing may be written there.
-std::string UsableTarget(const std::string& target, const WriterOptions& options) {
-    std::string real = ResolveTarget(target);
-    const int obstacle = CheckTarget(real);
-    if (obstacle == EEXIST && options.bKeepExisting != 0)
-        throw WriterFailure(kWriterErrorExists, "The file exists already.", EEXIST);
-    if (obstacle != 0 && obstacle != EEXIST)
-        throw SystemFailure(kWriterErrorOpen, obstacle, "The name belongs to something that is not a file");
-    return real;
 }
 
 } // namespace
@@ -91,7 +81,7 @@ MediaFile::~MediaFile() = default;
 
 void MediaFile::OpenStages() {
     const EncoderFlags flags = FlagsFor(plan_);
-    if (plan_.pictures) {
+    if (plan_.HoldsPictures()) {
         pictures_ = std::make_unique<PictureStage>(*plan_.pictures, flags);
         const AVCodecContext& encoder = pictures_->Encoder();
         const PictureClock& clock = plan_.pictures->clock;
@@ -137,13 +127,14 @@ void MediaFile::StartPictures() {
 }
 
 bool MediaFile::WriteVideo(const VideoImage& image) {
-    if (!pictures_ || record_->Failed())
+    if (!plan_.pictures || record_->Failed())
         return false;
-    if (!Usable(image)) {
+    if (pictures_ && !Usable(image)) {
         refusedPictures_ = true;
         return false;
     }
-    const int64_t time = stamps_.AddPicture(image.llTime);
+    const int64_t begin = plan_.piece == kWriterPiecePictures ? record_->Options().llPieceBegin : 0;
+    const int64_t time = begin + stamps_.AddPicture(image.llTime);
     if (!firstPicture_) {
         firstPicture_ = time;
         sourceBegin_ = SourceTime(image.reserved);
@@ -158,7 +149,7 @@ bool MediaFile::WriteVideo(const VideoImage& image) {
         StartSoundIfKnown();
         StartBeside();
         beside_.Reach(time + SourceBegin());
-        return pictures_->Push(image, time);
+        return !pictures_ || pictures_->Push(image, time);
     } catch (...) {
         Fail(std::current_exception());
         return false;
@@ -182,7 +173,7 @@ bool MediaFile::WriteAudio(const AudioFrame& frame) {
 }
 
 bool MediaFile::AddSound(const AudioFrame& frame, const PcmFormat& format) {
-    if (!pictures_ && !sourceBegin_)
+    if (!plan_.pictures && !sourceBegin_)
         sourceBegin_ = SourceTime(frame.reserved);
     stamps_.AddSound(frame.llTime, frame.nLength, format.BytesPerSecond(), frame.nType == kMediaTypeSilence);
     record_->Update([&](WriterStatus& status) {

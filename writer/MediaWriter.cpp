@@ -4,6 +4,7 @@
 #include "api/Version.h"
 #include "text/Utf8.h"
 #include "writer/FormatTable.h"
+#include "writer/JoinedFile.h"
 #include "writer/MediaFile.h"
 #include "writer/OptionSets.h"
 #include "writer/WriterStatus.h"
@@ -16,6 +17,7 @@ namespace {
 
 using writer::Extras;
 using writer::FileRecord;
+using writer::JoinedFile;
 using writer::MediaFile;
 using writer::OptionSet;
 using writer::OptionSets;
@@ -40,8 +42,10 @@ void Refuse(FileRecord& record, const WriterFailure& failure) {
     record.Tell(kWriterEventRefused);
 }
 
-MediaFile* Create(const wchar_t* fileName, const EncodeParam* param, const VideoFormat* video,
-                  const AudioFormat* audio) {
+/// A file of the set that `param` names, made by `make`, which gets its target and its record. Null, and
+/// told, when it cannot be made.
+template <class File, class Make>
+std::unique_ptr<File> Create(const wchar_t* fileName, const EncodeParam* param, Make make) {
     std::shared_ptr<OptionSet> set = OptionSets::Instance().Named(param);
     const bool known = set != nullptr;
     if (!known) // the refusal has to be told somewhere
@@ -56,15 +60,30 @@ MediaFile* Create(const wchar_t* fileName, const EncodeParam* param, const Video
             throw WriterFailure(kWriterErrorArgument, "There is no file name, or there are no parameters.");
         if (!known)
             throw WriterFailure(kWriterErrorArgument, "The parameters name options that are not registered.");
-        auto file = std::make_unique<MediaFile>(target, *param, video, audio, record, writer::SystemFiles());
+        std::unique_ptr<File> file = make(target, record);
         record->Tell(kWriterEventOpened);
-        return file.release();
+        return file;
     } catch (...) {
         const WriterFailure failure = writer::FailureOf(std::current_exception());
         FileRecord unlisted = set->Unlisted(); // where there is no memory for a record
         Refuse(record ? *record : unlisted, failure);
         return nullptr;
     }
+}
+
+/// Throws WriterFailure when the record makes no sense.
+JoinedFile::Parts PartsOf(const WriterJoin* join) {
+    constexpr int kLeastPieces = 2; // one with pictures, and the rest
+    if (join == nullptr || join->nSize < sizeof *join || join->nPieces < kLeastPieces ||
+        join->pszPieces == nullptr)
+        throw WriterFailure(kWriterErrorArgument, "There are no pieces to join.");
+    JoinedFile::Parts parts;
+    parts.pictures.assign(join->pszPieces, join->pszPieces + join->nPieces - 1);
+    parts.rest = join->pszPieces[join->nPieces - 1];
+    parts.sourceBegin = join->llSourceBegin;
+    if (join->pfnGoesOn != nullptr)
+        parts.goesOn = [join](double share) { return join->pfnGoesOn(join->pContext, share) != 0; };
+    return parts;
 }
 
 int CopyStatus(const std::shared_ptr<const FileRecord>& record, WriterStatus* status) {
@@ -97,7 +116,12 @@ const FileFormatInfo* MWGetFileFormatInfos(void) {
 
 void* MWCreateMediaFile(const wchar_t* fileName, const EncodeParam* param, const VideoFormat* video,
                         const AudioFormat* audio) {
-    return Guarded<void*>(nullptr, [&] { return Create(fileName, param, video, audio); });
+    return Guarded<void*>(nullptr, [&]() -> void* {
+        const auto make = [&](const std::string& target, const std::shared_ptr<FileRecord>& record) {
+            return std::make_unique<MediaFile>(target, *param, video, audio, record, writer::SystemFiles());
+        };
+        return Create<MediaFile>(fileName, param, make).release();
+    });
 }
 
 int MWWriteVideoFrame(void* file, const VideoImage* image) {
@@ -245,6 +269,38 @@ int MWGetLastFailure(uint32_t set, WriterStatus* status) {
 
 int MWGetThreadFileStatus(WriterStatus* status) {
     return Guarded(0, [&] { return CopyStatus(t_record, status); });
+}
+
+int MWPlanTicks(const EncodeParam* param, const VideoFormat* video, const int64_t* times, int64_t count,
+                int64_t* ticks) {
+    return Guarded(0, [&] {
+        if (param == nullptr || video == nullptr || times == nullptr || ticks == nullptr)
+            return 0;
+        const writer::FilePlan plan = writer::MakeFilePlan(*param, video, nullptr, WriterOptions{}, Extras{});
+        if (!plan.pictures)
+            return 0;
+        writer::PicturePacer pacer(plan.pictures->clock, plan.pictures->keepStamps);
+        for (int64_t i = 0; i < count; ++i) {
+            if (!pacer.AnswersAtOnce()) // this picture shows the one before until here
+                pacer.Add(times[i]);
+            ticks[i] = pacer.LastTick().value_or(kWriterNoTick);
+            if (pacer.AnswersAtOnce())
+                pacer.Add(times[i]);
+        }
+        return 1;
+    });
+}
+
+int MWJoinPieces(const wchar_t* fileName, const EncodeParam* param, const VideoFormat* video,
+                 const AudioFormat* audio, const WriterJoin* join) {
+    return Guarded(0, [&] {
+        const auto make = [&](const std::string& target, const std::shared_ptr<FileRecord>& record) {
+            return std::make_unique<JoinedFile>(target, *param, video, audio, record, writer::SystemFiles(),
+                                                PartsOf(join));
+        };
+        const std::unique_ptr<JoinedFile> file = Create<JoinedFile>(fileName, param, make);
+        return file && file->Write() ? 1 : 0;
+    });
 }
 
 unsigned MWGetVersion(void) {

@@ -114,7 +114,7 @@ void Mp4Index::AddStream(const MuxedStream& stream, int64_t delay) {
 void Mp4Index::Begin() {
     if (std::exchange(begun_, true))
         return;
-    muxer_.WriteHeader();
+    muxer_.WriteHeader(0);
     for (size_t stream = 0; stream < streams_.size(); ++stream)
         streams_[stream].muxedUnit = muxer_.Stream(static_cast<int>(stream)).description.unit;
 }

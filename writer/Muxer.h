@@ -7,6 +7,7 @@
 #include "writer/Extras.h"
 #include "writer/FormatTable.h"
 #include "writer/HdrLight.h"
+#include "writer/PacketWriter.h"
 
 #include <condition_variable>
 #include <cstdint>
@@ -16,20 +17,8 @@
 
 namespace writer {
 
-/// One stream as it enters a muxer.
-struct MuxedStream {
-    const AVCodecParameters* parameters; ///< Read during AddStream only.
-    AVRational unit;                     ///< Unit of the packets' times, in seconds.
-    AVRational rate;                     ///< Pictures per second; 0/1 for sound.
-    AVRational sampleAspect;             ///< Shape of the pixels; 0/1 for sound.
-    int64_t runUp;                       ///< How far below 0 times can begin, in the unit.
-    const Carriage* carriage;            ///< How the container carries its codec.
-    const TrackLabel* label;             ///< What is said about it; lives as long as the muxer.
-    const HdrLight* light = nullptr;     ///< Of HDR pictures, which lives as long as the muxer; may be null.
-};
-
 /// Streams are added, the header is written, then packets come from any thread, then the end.
-class Muxer {
+class Muxer final : public PacketWriter {
 public:
     /// `fragmented`: the file can be played up to wherever it ends, at the price of an index spread all over
     /// it. All functions throw WriterFailure (kWriterErrorEncode) or std::bad_alloc; where `file` has failed,
@@ -40,17 +29,17 @@ public:
 
     /// Returns the stream's number, from 0 on. A fragmented file cannot express times below 0: all its times
     /// are later by the longest run-up.
-    int AddStream(const MuxedStream& stream);
+    int AddStream(const MuxedStream& stream) override;
 
     /// `room`: bytes that stay free in front of a fragmented file's description; before all of it where that
     /// has to wait for the first packets.
-    void WriteHeader(int64_t room = 0);
+    void WriteHeader(int64_t room) override;
 
     /// Chapters on the file's timeline, before its end; where it is fragmented, it takes none.
-    void SetChapters(const std::vector<Chapter>& chapters);
+    void SetChapters(const std::vector<Chapter>& chapters) override;
 
     /// Takes the packet's content. Times are in the stream's unit; those of decoding must not fall.
-    void Write(AVPacket& packet, int stream);
+    void Write(AVPacket& packet, int stream) override;
 
     /// Names a packet that lies at `position` of the file already, in the form that the container gives it:
     /// its times are in the unit that Stream tells, and its content is written there once more. For one
@@ -58,29 +47,22 @@ public:
     void WriteAt(AVPacket& packet, int64_t position);
 
     /// The end of the file; a second call does nothing.
-    void WriteTrailer();
+    void WriteTrailer() override;
 
-    /// What a reader of the file, and a second muxer for the same packets, need to know of a stream.
-    struct Written {
-        MuxedStream description; ///< In the file's unit.
-        int64_t delay; ///< By how much times in the file are later than those that came, in that unit.
-        int64_t packets;
-        double seconds; ///< From the start of the first packet to the end of the last, without run-up.
-    };
-    Written Stream(int stream) const;
+    Written Stream(int stream) const override;
 
     /// How much of the file, of which `size` bytes are on the disk, is whole: what follows is the beginning
     /// of something (a packet, a cluster, a fragment) whose end never came.
-    int64_t WholeSize(int64_t size) const;
+    int64_t WholeSize(int64_t size) const override;
 
     /// Whether the end can be written: there has been a packet of each stream that is described by one.
-    bool Describable() const;
+    bool Describable() const override;
 
     /// Whether no packet was taken yet.
-    bool Empty() const;
+    bool Empty() const override;
 
     /// Streams that were added, without those of covers and attachments.
-    int StreamCount() const { return static_cast<int>(streams_.size()); }
+    int StreamCount() const override { return static_cast<int>(streams_.size()); }
 
 private:
     struct State {

@@ -2,13 +2,26 @@
 
 #include "text/Path.h"
 #include "writer/Fragments.h"
+#include "writer/Muxer.h"
+#include "writer/PieceFile.h"
 #include "writer/WriterFailure.h"
 #include "writer/WriterStatus.h"
 
 #include <algorithm>
+#include <cerrno>
 #include <utility>
 
 namespace writer {
+
+std::string UsableTarget(const std::string& target, const WriterOptions& options) {
+    std::string real = ResolveTarget(target);
+    const int obstacle = CheckTarget(real);
+    if (obstacle == EEXIST && options.bKeepExisting != 0)
+        throw WriterFailure(kWriterErrorExists, "The file exists already.", EEXIST);
+    if (obstacle != 0 && obstacle != EEXIST)
+        throw SystemFailure(kWriterErrorOpen, obstacle, "The name belongs to something that is not a file");
+    return real;
+}
 
 PartFile::PartFile(const std::string& target, const FilePlan& plan, std::shared_ptr<FileRecord> record,
                    FileSystem& files)
@@ -30,8 +43,11 @@ PartFile::PartFile(const std::string& target, const FilePlan& plan, std::shared_
         io_ = std::make_unique<AvioFile>(
             std::move(file), AvioFile::Mode::kWrite,
             [this](int64_t waiting) { return record_->AskAboutFullDisk(waiting); }, std::move(tap));
-        muxer_ = std::make_unique<Muxer>(*plan.container, *io_, plan.Fragmented(), plan.bitExact,
-                                         *record_->ExtraParts());
+        if (plan.piece != kWriterPieceNone)
+            packets_ = std::make_unique<PieceWriter>(*io_, *record_);
+        else
+            packets_ = std::make_unique<Muxer>(*plan.container, *io_, plan.Fragmented(), plan.bitExact,
+                                               *record_->ExtraParts());
     } catch (...) {
         files_.Remove(path_);
         throw;
@@ -39,19 +55,19 @@ PartFile::PartFile(const std::string& target, const FilePlan& plan, std::shared_
 }
 
 void PartFile::WriteHeader() {
-    muxer_->WriteHeader(room_ ? room_->Size() : 0);
+    packets_->WriteHeader(room_ ? room_->Size() : 0);
     if (io_->Flush() != 0)
         throw WriterFailure(kWriterErrorWrite, "");
     TellSize();
 }
 
 void PartFile::Write(AVPacket& packet, int stream) {
-    muxer_->Write(packet, stream);
+    packets_->Write(packet, stream);
     TellSize();
 }
 
 void PartFile::WriteTrailer() {
-    muxer_->WriteTrailer();
+    packets_->WriteTrailer();
     const int error = io_->Flush();
     TellSize();
     if (error != 0)
@@ -61,7 +77,7 @@ void PartFile::WriteTrailer() {
 void PartFile::CutToWhole() {
     io_->Flush();
     const int64_t size = io_->Size();
-    const int64_t whole = fragmented_ ? WholeFragments(*File(), size) : muxer_->WholeSize(size);
+    const int64_t whole = fragmented_ ? WholeFragments(*File(), size) : packets_->WholeSize(size);
     const bool cut = whole < size && File()->Truncate(whole) >= 0;
     record_->Update([&](WriterStatus& status) { status.llBytesWritten = cut ? whole : size; });
 }

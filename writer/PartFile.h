@@ -8,7 +8,7 @@
 #include "writer/FileSystem.h"
 #include "writer/FragmentLog.h"
 #include "writer/Mp4Room.h"
-#include "writer/Muxer.h"
+#include "writer/PacketWriter.h"
 
 #include <exception>
 #include <memory>
@@ -16,6 +16,9 @@
 #include <string>
 
 namespace writer {
+
+/// Where the data of `target` really goes. Throws WriterFailure when nothing may be written there.
+std::string UsableTarget(const std::string& target, const WriterOptions& options);
 
 /// Created beside the target, under its name with ".part". Its record is told how it grows.
 class PartFile {
@@ -28,8 +31,8 @@ public:
     ~PartFile() = default;
 
     /// Streams are added to it before WriteHeader.
-    Muxer& Streams() { return *muxer_; }
-    const Muxer& Streams() const { return *muxer_; }
+    PacketWriter& Streams() { return *packets_; }
+    const PacketWriter& Streams() const { return *packets_; }
 
     /// The header, out to the disk. Throws WriterFailure.
     void WriteHeader();
@@ -71,7 +74,7 @@ private:
     std::optional<Mp4Room> room_;
     FragmentLog fragments_;
     std::unique_ptr<AvioFile> io_;
-    std::unique_ptr<Muxer> muxer_;
+    std::unique_ptr<PacketWriter> packets_;
 };
 
 } // namespace writer

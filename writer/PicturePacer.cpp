@@ -49,6 +49,11 @@ PictureClock MakePictureClock(AVRational rate, bool wholePictures) {
 PicturePacer::PicturePacer(const PictureClock& clock, bool keepStamps)
     : clock_(clock), keepStamps_(keepStamps) {}
 
+void PicturePacer::ContinueAfter(int64_t tick) {
+    origin_ = 0;
+    lastTick_ = tick;
+}
+
 PicturePacer::Showing PicturePacer::Add(int64_t time) {
     if (!origin_)
         origin_ = time;
@@ -65,10 +70,10 @@ PicturePacer::Showing PicturePacer::Add(int64_t time) {
     return showing;
 }
 
-PicturePacer::Showing PicturePacer::Finish(int64_t end) {
+PicturePacer::Showing PicturePacer::Finish(int64_t end, bool more) {
     // A file too short for the grid still shows a picture; otherwise one whose place is the end would only
     // make the file longer.
-    const int64_t atLeast = lastTick_ ? 0 : pending_.value_or(0) + 1;
+    const int64_t atLeast = lastTick_ || more ? 0 : pending_.value_or(0) + 1;
     return ShowUntil(std::max(GridIndex(end), atLeast));
 }
 

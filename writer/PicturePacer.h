@@ -34,6 +34,13 @@ public:
     /// filled exactly.
     PicturePacer(const PictureClock& clock, bool keepStamps);
 
+    /// Goes on in a movie that began at 0 and of which the picture shown last is at `tick`. Before the first
+    /// picture.
+    void ContinueAfter(int64_t tick);
+
+    /// The last tick given out; nothing before the first.
+    std::optional<int64_t> LastTick() const { return lastTick_; }
+
     /// Whether a picture's showing is known when it comes. On the grid it is when the next one has come.
     bool AnswersAtOnce() const { return keepStamps_; }
 
@@ -47,8 +54,9 @@ public:
     /// is answered at once, else that of the picture before.
     Showing Add(int64_t time);
 
-    /// Returns the showing of the last picture, which lasts until `end`, if it is still open.
-    Showing Finish(int64_t end);
+    /// Returns the showing of the last picture, which lasts until `end`, if it is still open. `more`: another
+    /// picture is shown there, by someone else.
+    Showing Finish(int64_t end, bool more = false);
 
 private:
     std::optional<int64_t> TickOf(int64_t time);

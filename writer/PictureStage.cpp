@@ -36,7 +36,10 @@ PictureStage::PictureStage(const PicturePlan& plan, EncoderFlags flags)
       scaler_(plan.picture, plan.sourceAspect, plan.stretch, plan.sourceFullRange),
       thread_(kMostPictures, 0,
               {L"MediaWriter::The conversion waits for the picture encoder",
-               L"MediaWriter::The picture encoder waits for the conversion"}) {}
+               L"MediaWriter::The picture encoder waits for the conversion"}) {
+    if (plan.tickBefore)
+        pacer_.ContinueAfter(*plan.tickBefore);
+}
 
 void PictureStage::Start(PacketTaker take, Shown shown, StageFailure failed) {
     take_ = std::move(take);
@@ -62,7 +65,7 @@ void PictureStage::Run() {
         // At once where possible: most of the picture is still in the processor's cache then.
         Show(pacer_.AnswersAtOnce() ? std::move(*frame) : std::exchange(open, std::move(*frame)), showing);
     }
-    Show(std::move(open), pacer_.Finish(end));
+    Show(std::move(open), pacer_.Finish(plan_.end.value_or(end), plan_.end.has_value()));
     encoder_.Finish(take_);
 }
 

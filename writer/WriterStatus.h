@@ -20,7 +20,11 @@
 #ifndef MOVIECONV_WRITER_WRITERSTATUS_H
 #define MOVIECONV_WRITER_WRITERSTATUS_H
 
+#include "media/EncodeParam.h"
+#include "media/MediaRecords.h"
+
 #include <stdint.h>
+#include <wchar.h>
 
 #ifdef __cplusplus
 /// In C++ a record comes with its size; in C the caller fills it in.
@@ -175,7 +179,24 @@ typedef struct WriterOptions {
     WriterMasteringDisplay masteringDisplay;
     int32_t nBrightestPixel;   ///< cd/m2 of the brightest pixel of all pictures; 0: not known.
     int32_t nBrightestPicture; ///< cd/m2, the highest average of a picture; 0: not known.
+    /// Nonzero, kWriterPiece...: what is created is not the file but a piece of it, which MWJoinPieces takes.
+    int32_t nPiece;
+    int32_t
+        bPieceContinues; ///< Nonzero: a picture of the file is shown before this piece's; see llPieceTick.
+    /// Where a piece with pictures lies in the file, in 100 ns units: its first picture, and the first of the
+    /// piece that follows, -1 for the last one.
+    int64_t llPieceBegin;
+    int64_t llPieceEnd;
+    int64_t llPieceTick; ///< As MWPlanTicks tells it for the piece's first picture.
 } WriterOptions;
+
+/// What a piece holds.
+enum {
+    kWriterPieceNone = 0,     ///< It is no piece.
+    kWriterPiecePictures = 1, ///< Some of the pictures.
+    /// All the rest. The pictures come without their planes: their stamps decide where the sound ends.
+    kWriterPieceRest = 2
+};
 
 /// What distinguishes a file format beside what FileFormatInfo says.
 enum {
@@ -302,6 +323,32 @@ int MWGetLastFailure(uint32_t set, WriterStatus* status);
 /// Copies how the file stands that the calling thread created last, a refused one included, or has closed
 /// since. Returns 1; 0 when there is none or `status` is null or its size makes no sense.
 int MWGetThreadFileStatus(WriterStatus* status);
+
+/// The ticks of a file's pictures, by which a piece goes on where another one ends: for each of `count`
+/// rising times in the file (100 ns units, the first is 0) that of the picture shown last before it, or
+/// kWriterNoTick. The parameters are those of MWCreateMediaFile. Returns 1; 0 when they make no sense or
+/// there is no memory.
+int MWPlanTicks(const EncodeParam* param, const VideoFormat* video, const int64_t* times, int64_t count,
+                int64_t* ticks);
+
+#define kWriterNoTick INT64_MIN
+
+/// What MWJoinPieces makes a file of.
+typedef struct WriterJoin {
+    uint32_t nSize MW_SIZE_OF(WriterJoin); ///< Size of this record in bytes.
+    int32_t nPieces;
+    /// Paths of the pieces: those with pictures in their order, then the rest.
+    const char* const* pszPieces;
+    int64_t llSourceBegin; ///< Where the file's first picture stands in the source, in 100 ns units.
+    /// Told the share done, 0 to 1, now and then. 0 ends the work, and the file fails. May be null.
+    int (*pfnGoesOn)(void* context, double share);
+    void* pContext;
+} WriterJoin;
+
+/// Makes one file of pieces, as MWCreateMediaFile and all that follows would have made it: the listener hears
+/// of it in the same way. Returns 1 when it is complete under its name.
+int MWJoinPieces(const wchar_t* fileName, const EncodeParam* param, const VideoFormat* video,
+                 const AudioFormat* audio, const WriterJoin* join);
 
 /// The writer's version, as MC_MAKE_VERSION makes it. An engine of another major version refuses the writer.
 unsigned MWGetVersion(void);

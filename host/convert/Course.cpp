@@ -7,6 +7,7 @@
 #include "host/convert/Judgement.h"
 #include "host/convert/Room.h"
 #include "host/convert/SizePlan.h"
+#include "host/source/MediaTime.h"
 #include "text/Path.h"
 
 #include <algorithm>
@@ -43,6 +44,12 @@ std::string TellCrop(const PictureStreamInfo& pictures) {
                        pictures.width, pictures.height, crop.top, crop.bottom, crop.left, crop.right);
 }
 
+/// Of a piece the plan knows it better than the source.
+double LengthOf(const Request& request, const SourceInfo& source) {
+    return request.piece && request.piece->pictures ? ToSeconds(request.piece->end - request.piece->begin)
+                                                    : LengthToConvert(request, source);
+}
+
 WorkClock::Time Now() {
     return std::chrono::steady_clock::now();
 }
@@ -54,13 +61,15 @@ Course::Course(const Request& request, Movie& movie, Wishes& wishes, Observer& o
       movie_(movie),
       wishes_(wishes),
       observer_(observer),
-      length_(LengthToConvert(request_, movie.Info())),
+      length_(LengthOf(request_, movie.Info())),
       clips_(movie, request.begin, request.split),
       watch_(request_, movie.Info(), wishes.bell),
       files_(observer),
       engine_(MakeEngine(request_, movie.Info(), clips_.Pictures(), clips_.Sound(), watch_.OptionSet())),
       clock_(Now()) {
-    if (request.length)
+    if (request.piece && request.piece->pictures)
+        movie.EndPicturesAt(ToSeconds(request.piece->end));
+    else if (request.length)
         movie.EndPicturesAt(request.begin + length_);
     if (movie.KeepsHdr())
         wishes.pictures.TakesHdr(*movie.Info().pictures);
@@ -69,13 +78,17 @@ Course::Course(const Request& request, Movie& movie, Wishes& wishes, Observer& o
 Verdict Course::Run() {
     const bool lengthKnown = movie_.Info().certainty != Certainty::kGuessed;
     observer_.Started({request_.input, request_.output, length_, lengthKnown});
-    for (const NotCarried& left : CarryOver(movie_, request_, ChooseFormat(request_), watch_.OptionSet()))
-        observer_.LeftBehind(left);
+    if (!request_.piece || !request_.piece->pictures) {
+        for (const NotCarried& left : CarryOver(movie_, request_, ChooseFormat(request_), watch_.OptionSet()))
+            if (!request_.piece) // who joins the pieces tells it
+                observer_.LeftBehind(left);
+    }
     if (request_.maxSize)
         observer_.Warned({Warning::Kind::kChosen, TellSize(request_)});
-    if (request_.detectCrop && movie_.Info().pictures)
+    if (!request_.piece && request_.detectCrop && movie_.Info().pictures)
         observer_.Warned({Warning::Kind::kChosen, TellCrop(*movie_.Info().pictures)});
-    if ((lengthKnown || request_.length) && HasRates(request_, ChooseFormat(request_), movie_.Info()))
+    if (!request_.piece && (lengthKnown || request_.length) &&
+        HasRates(request_, ChooseFormat(request_), movie_.Info()))
         WarnOfSmallRoom();
     clock_.Skip(Now());
     RunEngine(request_.begin, request_.length.value_or(0));
@@ -296,6 +309,7 @@ Verdict Course::Conclude() {
     verdict.worked = clock_.Seconds();
     verdict.bytes = files_.Bytes();
     verdict.files = files_.Complete();
+    verdict.damaged = movie_.DamagedPictures();
     return verdict;
 }
 

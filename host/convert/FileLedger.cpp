@@ -116,7 +116,8 @@ void FileLedger::EnterClosed(const WriterWatch::News& news) {
                                      news.identity.size, file.llBytesWritten));
     }
     bytes_ += file.llBytesWritten;
-    observer_.Closed({opened_, file.szPath, file.dVideoWritten, file.dAudioWritten, file.llBytesWritten});
+    observer_.Closed({opened_, file.szPath, file.dVideoWritten, file.dAudioWritten, file.llBytesWritten,
+                      file.llPicturesReceived});
     if (const std::string missing = MissingFrom(file); !missing.empty() && !failure_)
         failure_.emplace(Category::kInternal, missing);
 }

@@ -4,6 +4,7 @@
 
 #include "host/convert/Observer.h"
 #include "host/convert/Request.h"
+#include "host/convert/Work.h"
 
 #include <chrono>
 #include <functional>
@@ -18,25 +19,22 @@ using Loop = std::function<void(std::function<void()>)>;
 
 /// Converts one movie, once. A process may have any number of them. All functions may be called on any
 /// thread and return at once, but for Wait and the destructor.
-class Job {
+class Job final : public Work {
 public:
     /// `observer` hears the news by means of `loop`; without one on the conversion's own thread, where it
     /// must return soon and must not wait for the job.
     Job(Request request, Observer& observer, Loop loop = {});
-    Job(const Job&) = delete;
-    Job& operator=(const Job&) = delete;
-
     /// Stops and waits for the end. No news comes afterwards. On the observer's thread.
-    ~Job();
+    ~Job() override;
 
     /// Begins, once. Throws std::system_error when there is no thread for it.
-    void Start();
+    void Start() override;
 
-    void Pause();
-    void Resume();
+    void Pause() override;
+    void Resume() override;
 
     /// Ends the conversion: what was converted so far becomes a complete file, and the outcome is kStopped.
-    void Stop();
+    void Stop() override;
 
     /// While it waits for room on a full disk: try the write again now; or give up, and the file fails.
     void RetryWrite();
@@ -50,7 +48,7 @@ public:
 
     /// How it ended; null before. Stays valid as long as the job, and is there even when no memory was left
     /// to tell the observer.
-    const Verdict* Result() const;
+    const Verdict* Result() const override;
 
 private:
     class Impl;

@@ -52,6 +52,7 @@ struct ClosedFile {
     double videoSeconds; ///< In the file; 0 without such a stream.
     double audioSeconds;
     int64_t bytes;
+    int64_t pictures; ///< Taken from the source.
 };
 
 struct Warning {
@@ -59,6 +60,7 @@ struct Warning {
         kSmallRoom,    ///< The output will probably not find enough room.
         kWaitsForRoom, ///< The disk is full; the conversion goes on when there is room, or ends by Stop.
         kChosen,       ///< What was chosen for Request::maxSize or Request::detectCrop.
+        kLeftover,     ///< Something of an earlier run is there and not used.
         kSource,       ///< Something was wrong with the source and has been put right or skipped.
     };
     Kind kind;
@@ -95,6 +97,7 @@ struct Verdict {
     double worked = 0;              ///< Seconds, pauses left out.
     int64_t bytes = 0;              ///< Of the complete files.
     int files = 0;                  ///< Complete ones.
+    int64_t damaged = 0;            ///< Pieces of the source's picture data that were skipped.
 };
 
 /// Hears what happens in a conversion, always on the thread that it chose; see Job. Started comes once at

@@ -23,6 +23,17 @@ enum class Fit { kStretch, kBorders };
 /// of 10 bits.
 enum class Hdr { kAuto, kKeep, kSdr };
 
+/// A piece of an output. Times are in media time, from the start of the source.
+struct PieceCut {
+    bool pictures = true;        ///< Pictures only; or all the rest, for which their stamps are read.
+    int64_t origin = 0;          ///< Stamp of the output's first picture.
+    int64_t begin = 0;           ///< Stamp of this piece's first picture.
+    int64_t end = 0;             ///< Stamp of the next piece's first picture, or where the last one ends.
+    bool last = false;           ///< No pictures follow.
+    std::optional<int64_t> tick; ///< By the media writer's plan; nothing before the first picture shown.
+    bool fromStart = false;      ///< The source can only be read from its start.
+};
+
 /// Names are bytes as the system has them. What is not given is left to the preferences, then to the engine's
 /// defaults and the source.
 struct Request {
@@ -66,8 +77,11 @@ struct Request {
     OnFull onFull = OnFull::kStop;
     bool keepPartial = true; ///< Whether the temporary file of a conversion that failed stays; it plays.
 
+    std::optional<PieceCut> piece; ///< Make this piece of the output, to be joined with others.
+
     /// How far all threads of the conversion stand back behind what else the machine does, 0 to 19.
     int niceness = 0;
+
     int encoderThreads = 0; ///< Of the picture encoder; 0 leaves it to the writer.
     bool bitExact = false;  ///< Nothing in the file tells time, date or library version.
 

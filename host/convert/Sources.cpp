@@ -12,8 +12,10 @@ namespace {
 
 SourceChoice ChoiceOf(const Request& request) {
     return {.pictures = !request.noVideo,
-            .sound = !request.noAudio,
+            .sound = !request.noAudio && !(request.piece && request.piece->pictures),
             .deinterlace = request.deinterlace,
+            .stampsOnly = request.piece && !request.piece->pictures,
+            .fromStart = request.piece && request.piece->fromStart,
             .playlists = request.playlists};
 }
 

@@ -46,6 +46,14 @@ void TellColours(WriterOptions& writer, const PictureStreamInfo& pictures, bool 
     }
 }
 
+void SetPiece(WriterOptions& writer, const PieceCut& piece) {
+    writer.nPiece = piece.pictures ? kWriterPiecePictures : kWriterPieceRest;
+    writer.bPieceContinues = piece.tick ? 1 : 0;
+    writer.llPieceTick = piece.tick.value_or(0);
+    writer.llPieceBegin = piece.begin - piece.origin;
+    writer.llPieceEnd = piece.last ? -1 : piece.end - piece.origin;
+}
+
 } // namespace
 
 FileIdentity IdentityOf(const std::string& path) noexcept {
@@ -75,6 +83,8 @@ WriterWatch::WriterWatch(const Request& request, const SourceInfo& source, Bell&
     writer.nEncoderThreads = request.encoderThreads;
     writer.bBitExact = request.bitExact ? 1 : 0;
     writer.dFileLength = request.split.value_or(request.length.value_or(0));
+    if (request.piece)
+        SetPiece(writer, *request.piece);
     writer.pfnListener = OnEvent;
     writer.pfnFullDisk = request.onFull == OnFull::kWait ? OnFullDisk : nullptr;
     writer.pContext = this;

@@ -43,6 +43,8 @@ Demuxer::~Demuxer() {
 
 bool Demuxer::Seek(double seconds) {
     const std::lock_guard lock(mutex_);
+    if (staysAtStart_)
+        return false;
     if (started_ || stopping_ || seconds == soughtSeconds_)
         return soughtWell_ && seconds == soughtSeconds_;
     soughtSeconds_ = seconds;

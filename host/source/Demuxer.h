@@ -38,6 +38,9 @@ public:
     /// source cannot be sought: it is then read from its start.
     bool Seek(double seconds);
 
+    /// Reads all from the source's start: Seek does nothing and tells false. Only before Seek.
+    void StayAtStart() { staysAtStart_ = true; }
+
     /// The next packet of a stream; waits for it. Null at the end of the stream or after Stop.
     av::Packet Take(int stream);
 
@@ -99,6 +102,7 @@ private:
     Failures& failures_;
     double soughtSeconds_ = -1;
     bool soughtWell_ = false;
+    bool staysAtStart_ = false;
     bool moved_ = false; // away from the start
 
     mutable std::mutex mutex_;

@@ -12,7 +12,11 @@ Movie::Movie(const std::string& path, const SourceChoice& choice, std::shared_pt
       source_(path, choice, std::move(interruption)),
       failures_([this] { demuxer_.Stop(); }),
       demuxer_(source_, failures_) {
-    if (source_.PictureStream() != nullptr)
+    if (choice.fromStart)
+        demuxer_.StayAtStart();
+    if (source_.PictureStream() != nullptr && choice.stampsOnly)
+        stamps_ = std::make_unique<PictureStamps>(source_, demuxer_);
+    else if (source_.PictureStream() != nullptr)
         pictures_ = std::make_unique<PictureDecoder>(source_, demuxer_, failures_, choice);
     if (source_.SoundStream() != nullptr)
         sound_ = std::make_unique<SoundDecoder>(source_, demuxer_, failures_);
@@ -21,6 +25,8 @@ Movie::Movie(const std::string& path, const SourceChoice& choice, std::shared_pt
 void Movie::EndPicturesAt(double seconds) {
     if (pictures_)
         pictures_->EndAt(seconds);
+    if (stamps_)
+        stamps_->EndAt(seconds);
 }
 
 void Movie::SetBounds(double begin, bool ends, bool isCut) {
@@ -65,7 +71,7 @@ void Movie::Stop() {
 std::optional<Shortfall> Movie::Missing() const {
     const auto reached = [&](int stream) { return ToSeconds(demuxer_.EndOf(stream).value_or(0)); };
     Reached ends;
-    if (pictures_ && pictures_->RanDry())
+    if ((pictures_ && pictures_->RanDry()) || (stamps_ && stamps_->RanDry()))
         ends.pictures = reached(Info().pictures->index);
     if (sound_ && sound_->RanDry())
         ends.sound = reached(Info().sound->index);

@@ -6,6 +6,7 @@
 #include "host/source/Demuxer.h"
 #include "host/source/Failures.h"
 #include "host/source/PictureDecoder.h"
+#include "host/source/PictureStamps.h"
 #include "host/source/SoundDecoder.h"
 #include "host/source/Source.h"
 
@@ -31,7 +32,7 @@ public:
     std::vector<uint8_t> StoredFile(int stream) const { return source_.StoredFile(stream); }
 
     /// Null when the movie has no such stream or it was not asked for.
-    VideoDecoder* Pictures() { return pictures_.get(); }
+    VideoDecoder* Pictures() { return stamps_ ? static_cast<VideoDecoder*>(stamps_.get()) : pictures_.get(); }
     AudioDecoder* Sound() { return sound_.get(); }
 
     /// The picture handed out last, null without one. Once the conversion has ended.
@@ -73,6 +74,13 @@ public:
     /// it holds all. Once both streams ended.
     std::optional<Shortfall> Missing() const;
 
+    /// Pieces of picture data that were skipped. Once the pictures ended.
+    int64_t DamagedPictures() const { return pictures_ ? pictures_->Damaged() : 0; }
+
+    /// Pictures without a stamp, where only stamps are read, and jumps of the clock. Once the pictures ended.
+    int64_t UnstampedPictures() const { return stamps_ ? stamps_->Unstamped() : 0; }
+    int ClockJumps() const { return demuxer_.ClockJumps(); }
+
     /// What was wrong with the movie and has been put right or skipped, a sentence each. Once both streams
     /// ended.
     std::vector<std::string> Complaints() const;
@@ -85,6 +93,7 @@ private:
     Failures failures_;
     Demuxer demuxer_;
     std::unique_ptr<PictureDecoder> pictures_;
+    std::unique_ptr<PictureStamps> stamps_; // instead of pictures_
     std::unique_ptr<SoundDecoder> sound_;
     BesideBounds bounds_;
     std::vector<int> besideStreams_;

@@ -86,7 +86,8 @@ AudioFrame* SoundDecoder::GetNextFrame() {
     block_.nLength = static_cast<int32_t>(bytes);
     block_.nBufferSize = static_cast<int32_t>(left);
     block_.llTime = block_.llTime2 =
-        begin_ + av_rescale(samplesDelivered_, kTicksPerSecond, format.nSampleRate);
+        begin_ + av_rescale_rnd(samplesDelivered_, kTicksPerSecond, format.nSampleRate,
+                                AV_ROUND_DOWN); // as the writer
     TellSourceTime(block_.reserved, block_.llTime);
     block_.nDuration =
         static_cast<int32_t>(av_rescale(bytes / frameBytes_, kTicksPerSecond, format.nSampleRate));

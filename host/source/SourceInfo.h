@@ -145,10 +145,12 @@ struct SourceChoice {
     bool pictures = true; ///< Look for pictures at all.
     bool sound = true;    ///< Look for sound at all.
     Deinterlace deinterlace = Deinterlace::kFlagged;
-    bool deep = false;      ///< Pictures of more than 8 bits are handed out with 10; otherwise with 8.
-    Crop crop{};            ///< Cut off the pictures; odd numbers are lowered by one.
-    bool keepHdr = false;   ///< HDR pictures are handed out as they are; otherwise as BT.709.
-    bool playlists = false; ///< Also open what names other movies, in its own folder and below.
+    bool deep = false;       ///< Pictures of more than 8 bits are handed out with 10; otherwise with 8.
+    Crop crop{};             ///< Cut off the pictures; odd numbers are lowered by one.
+    bool keepHdr = false;    ///< HDR pictures are handed out as they are; otherwise as BT.709.
+    bool stampsOnly = false; ///< Do not decode the pictures.
+    bool fromStart = false;  ///< Read from the start of the source, whatever the begin.
+    bool playlists = false;  ///< Also open what names other movies, in its own folder and below.
 };
 
 } // namespace movieconv

@@ -17,6 +17,8 @@ const char* AdviceFor(Reason reason) {
         return "; see --allow-playlists";
     case Reason::kUnknownLength:
         return "; use --length";
+    case Reason::kCannotResume:
+        return "; without --resume it is made anew";
     case Reason::kNoMemory:
     case Reason::kOther:
         break;
@@ -61,7 +63,14 @@ std::string Explain(const Failure& failure) {
 }
 
 std::string Explain(const Warning& warning) {
-    return warning.kind == Warning::Kind::kWaitsForRoom ? warning.text + ", Ctrl-C gives up" : warning.text;
+    switch (warning.kind) {
+    case Warning::Kind::kWaitsForRoom:
+        return warning.text + ", Ctrl-C gives up";
+    case Warning::Kind::kLeftover:
+        return warning.text + "; --resume goes on with it";
+    default:
+        return warning.text;
+    }
 }
 
 } // namespace movieconv

@@ -8,6 +8,7 @@
 #include "host/terminal/Help.h"
 
 #include <CLI/CLI.hpp>
+#include <charconv>
 #include <cstdio>
 #include <cstdlib>
 #include <fmt/format.h>
@@ -193,6 +194,58 @@ void AddRange(CLI::App& app, Options& options) {
         ->group(group);
 }
 
+std::optional<int> ParseJobs(std::string_view text) {
+    constexpr int kMostJobs = 256;
+    if (text == "auto")
+        return 0;
+    int number = 0;
+    const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
+    const bool whole = error == std::errc() && end == text.data() + text.size();
+    return whole && number >= 1 && number <= kMostJobs ? std::optional(number) : std::nullopt;
+}
+
+void AddPieces(CLI::App& app, Options& options) {
+    const std::string group = "In pieces";
+    AddParsed(app, "--jobs", ParseJobs, options.jobs, "a number from 1 to 256, or auto",
+              "Convert in pieces, N at once; auto: as many as pay")
+        ->type_name("N")
+        ->group(group);
+    app.add_option("--pieces", options.division.pieces,
+                   "Divide into N pieces; by default of a minute or more")
+        ->check(CLI::Range(1, kMostPieces).description(""))
+        ->type_name("N")
+        ->group(group);
+    AddParsed(app, "--piece-length", ParseTime, options.division.length, "a time such as 83.5 or 0:01:23.5",
+              "Divide into pieces of this length")
+        ->type_name("TIME")
+        ->group(group);
+    app.add_flag("--resume", options.resume, "Go on with what an earlier run of the same command left")
+        ->group(group);
+    app.add_option_function<std::string>(
+           "--plan",
+           [&](const std::string& name) {
+               options.task = Task::kPlan;
+               options.plan = name;
+           },
+           "Write a plan, by which pieces are made anywhere")
+        ->type_name("FILE")
+        ->group(group);
+    app.add_option_function<int>(
+           "--piece",
+           [&](int number) {
+               options.task = Task::kPiece;
+               options.piece = number;
+           },
+           "Make piece K, from 0, of the plan INPUT")
+        ->type_name("K")
+        ->group(group);
+    app.add_flag_callback(
+           "--join", [&] { options.task = Task::kJoin; }, "Make the output of the pieces of the plan INPUT")
+        ->group(group);
+    app.add_flag("--keep-pieces", options.keepPieces, "Leave the pieces where they are once they are joined")
+        ->group(group);
+}
+
 void AddOutput(CLI::App& app, Options& options) {
     const std::string group = "Output";
     app.add_flag("-y,--overwrite", options.request.overwrite,
@@ -252,13 +305,38 @@ void AddReports(CLI::App& app, Options& options) {
         ->group("Instead of converting");
 }
 
+bool NeedsOutput(Task task) {
+    return task == Task::kConvert || task == Task::kEstimate || task == Task::kPlan;
+}
+
+bool NeedsInput(Task task) {
+    return NeedsOutput(task) || task == Task::kInfo || task == Task::kPiece || task == Task::kJoin;
+}
+
+void RequirePieces(const Options& options) {
+    const bool byPlan = options.task == Task::kPiece || options.task == Task::kJoin;
+    if (byPlan && !options.request.output.empty())
+        throw Failure(Category::kRequest, "--piece and --join take the plan alone: it names the output");
+    const bool divides = options.task == Task::kPlan || (options.task == Task::kConvert && options.jobs);
+    if ((options.division.pieces || options.division.length) && !divides)
+        throw Failure(Category::kRequest, "--pieces and --piece-length go with --jobs or --plan");
+    if (options.division.pieces && options.division.length)
+        throw Failure(Category::kRequest, "--pieces and --piece-length exclude each other");
+    if (options.jobs && options.task != Task::kConvert)
+        throw Failure(Category::kRequest,
+                      "--jobs goes with a conversion, not with --plan, --piece or --join");
+    if (options.resume && !options.jobs)
+        throw Failure(Category::kRequest, "--resume goes with --jobs");
+    if (options.jobs && options.preview)
+        throw Failure(Category::kRequest, "--jobs converts many places at once and so excludes --preview");
+}
+
 void RequireNames(const Options& options) {
-    const bool needsOutput = options.task == Task::kConvert || options.task == Task::kEstimate;
-    const bool needsInput = needsOutput || options.task == Task::kInfo;
-    if (needsInput && options.request.input.empty())
+    if (NeedsInput(options.task) && options.request.input.empty())
         throw Failure(Category::kRequest, "INPUT is missing; try \"movieconv --help\"");
-    if (needsOutput && options.request.output.empty())
+    if (NeedsOutput(options.task) && options.request.output.empty())
         throw Failure(Category::kRequest, "OUTPUT is missing; try \"movieconv --help\"");
+    RequirePieces(options);
     if (options.request.noVideo && options.request.noAudio)
         throw Failure(Category::kRequest, "--no-video and --no-audio together leave nothing to convert");
     if (options.request.maxSize && (options.request.quality || options.request.videoRate ||
@@ -318,6 +396,7 @@ std::optional<Options> ParseOptions(int argc, char** argv) {
     AddEncoding(app, options);
     AddPictures(app, options);
     AddSound(app, options);
+    AddPieces(app, options);
     AddOutput(app, options);
     AddReports(app, options);
     try {
@@ -333,7 +412,7 @@ std::optional<Options> ParseOptions(int argc, char** argv) {
         return std::nullopt;
     }
     RequireNames(options);
-    if (options.task == Task::kConvert || options.task == Task::kEstimate)
+    if (NeedsOutput(options.task))
         ApplyPreset(options);
     if (options.preview)
         options.request.preview = kPreviewInterval;

@@ -3,6 +3,7 @@
 #define MOVIECONV_HOST_TERMINAL_OPTIONS_H
 
 #include "host/convert/Request.h"
+#include "host/pieces/Plan.h"
 #include "host/presets/Preset.h"
 #include "host/terminal/Completion.h"
 
@@ -12,7 +13,7 @@
 
 namespace movieconv {
 
-enum class Task { kConvert, kInfo, kEstimate, kListFormats, kListPresets, kShowPreset };
+enum class Task { kConvert, kPlan, kPiece, kJoin, kInfo, kEstimate, kListFormats, kListPresets, kShowPreset };
 enum class ProgressStyle { kBar, kJson, kNone };
 
 /// Names are bytes as the system has them.
@@ -21,6 +22,13 @@ struct Options {
     Request request; ///< With the preset's preferences.
     std::string preset = kStandardPreset;
     std::vector<std::string> complaints; ///< Of the preset.
+
+    std::optional<std::string> plan; ///< Where a plan is to be written.
+    Division division;
+    int piece = 0;           ///< The number of the one to make.
+    std::optional<int> jobs; ///< Pieces at once; 0: as many as pay.
+    bool resume = false;
+    bool keepPieces = false;
 
     std::optional<std::string> log;
     bool quiet = false;

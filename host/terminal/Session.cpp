@@ -1,5 +1,8 @@
 #include "host/terminal/Session.h"
 
+#include "host/convert/Job.h"
+#include "host/pieces/Foreman.h"
+
 #include <chrono>
 #include <functional>
 #include <string>
@@ -10,6 +13,28 @@ namespace {
 
 constexpr std::chrono::milliseconds kTick{500};
 
+/// What the options ask for: one conversion, or pieces of it.
+std::unique_ptr<Work> MakeWork(const Options& options, Observer& observer, Loop loop) {
+    if (options.task == Task::kConvert && !options.jobs)
+        return std::make_unique<Job>(options.request, observer, std::move(loop));
+    PieceOrder order;
+    order.keepPieces = options.keepPieces;
+    order.replace = options.request.overwrite;
+    order.join = options.task != Task::kPiece;
+    if (options.task == Task::kConvert) {
+        order.planPath = PlanPathFor(options.request.output);
+        order.request = options.request;
+        order.division = options.division;
+        order.resume = options.resume;
+        order.jobs = options.jobs.value_or(0);
+    } else {
+        order.planPath = options.request.input;
+        if (options.task == Task::kPiece)
+            order.only = options.piece;
+    }
+    return std::make_unique<Foreman>(std::move(order), observer, std::move(loop));
+}
+
 } // namespace
 
 Session::Session(const Options& options, const StandardStreams& streams, MainLoop& loop,
@@ -18,14 +43,14 @@ Session::Session(const Options& options, const StandardStreams& streams, MainLoo
       loop_(loop),
       control_(control),
       reporter_(MakeReporter(options, streams)),
-      job_(options.request, *this, [&loop](std::function<void()> work) { loop.Post(std::move(work)); }) {}
+      work_(MakeWork(options, *this, [&loop](std::function<void()> work) { loop.Post(std::move(work)); })) {}
 
 ExitCode Session::Run() {
-    job_.Start();
+    work_->Start();
     while (!code_) {
         const bool quiet = !loop_.RunNext(kTick);
         control_.FollowTerminal();
-        if (const Verdict* verdict = job_.Result(); quiet && !code_ && verdict != nullptr)
+        if (const Verdict* verdict = work_->Result(); quiet && !code_ && verdict != nullptr)
             Ended(*verdict); // there was no memory to tell it
     }
     return *code_;
@@ -83,14 +108,14 @@ void Session::Ended(const Verdict& news) {
 void Session::Obey(Command command) {
     switch (command) {
     case Command::kStop:
-        job_.Stop();
+        work_->Stop();
         break;
     case Command::kPauseKey:
         paused_ = !paused_;
         if (paused_)
-            job_.Pause();
+            work_->Pause();
         else
-            job_.Resume();
+            work_->Resume();
         break;
     case Command::kSuspend:
         reporter_->LeaveLine();

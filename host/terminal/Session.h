@@ -2,8 +2,8 @@
 #ifndef MOVIECONV_HOST_TERMINAL_SESSION_H
 #define MOVIECONV_HOST_TERMINAL_SESSION_H
 
-#include "host/convert/Job.h"
 #include "host/convert/Observer.h"
+#include "host/convert/Work.h"
 #include "host/terminal/ControlInput.h"
 #include "host/terminal/ExitCode.h"
 #include "host/terminal/MainLoop.h"
@@ -44,7 +44,7 @@ private:
     bool started_ = false;
     bool paused_ = false;
     std::optional<ExitCode> code_;
-    Job job_; // last: the others hear from it
+    const std::unique_ptr<Work> work_; // last: the others hear from it
 };
 
 } // namespace movieconv

@@ -1,6 +1,7 @@
 #include "host/convert/Amounts.h"
 #include "host/convert/Room.h"
 #include "host/convert/Sources.h"
+#include "host/pieces/Plan.h"
 #include "host/presets/Preset.h"
 #include "host/terminal/ControlInput.h"
 #include "host/terminal/Describe.h"
@@ -68,6 +69,24 @@ ExitCode Estimate(const Options& options, const StandardStreams& streams) {
     return room.needed <= room.free ? ExitCode::kDone : ExitCode::kNoSpace;
 }
 
+ExitCode WriteNewPlan(const Options& options, const StandardStreams& streams) {
+    const std::string& path = *options.plan;
+    if (!options.request.overwrite && access(path.c_str(), F_OK) == 0)
+        throw Failure(Category::kOutput, fmt::format("\"{}\" exists", path), Reason::kExists);
+    std::optional<Plan> plan = MakePlan(options.request, options.division, nullptr, nullptr);
+    WritePlan(path, *plan);
+    if (options.quiet)
+        return ExitCode::kDone;
+    for (const std::string& complaint : options.complaints)
+        streams.PrintError(fmt::format("movieconv: warning: {}\n", complaint));
+    if (const std::string cost = TellBitRate(*plan); !cost.empty())
+        streams.PrintError(fmt::format("movieconv: warning: {}\n", cost));
+    PrintWhole(streams, fmt::format("{}: pieces 0 to {}, the last one is the sound and whatever else is "
+                                    "carried\n",
+                                    path, plan->Pieces() - 1));
+    return ExitCode::kDone;
+}
+
 /// Its text; what is odd about it goes to standard error.
 std::string ShowPreset(const std::string& name, const StandardStreams& streams) {
     try {
@@ -100,7 +119,11 @@ ExitCode Perform(const Options& options, const StandardStreams& streams, MainLoo
     }
     case Task::kEstimate:
         return Estimate(options, streams);
+    case Task::kPlan:
+        return WriteNewPlan(options, streams);
     case Task::kConvert:
+    case Task::kPiece:
+    case Task::kJoin:
         break;
     }
     return Session(options, streams, loop, control).Run();

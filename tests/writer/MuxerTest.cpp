@@ -67,7 +67,7 @@ public:
         static constexpr writer::Carriage kUsual;
         static const writer::TrackLabel kUnnamed;
         muxer_.AddStream({parameters.get(), {1, 48000}, {0, 1}, {0, 1}, 0, &kUsual, &kUnnamed});
-        muxer_.WriteHeader();
+        muxer_.WriteHeader(0);
     }
 
     void Write(int64_t bytes, int64_t samples) {

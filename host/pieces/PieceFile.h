@@ -1,0 +1,39 @@
+// The files that pieces are kept in: their names, and the seal at their end by which they are recognised.
+//
+// The seal stands in the same file, so that a piece and what vouches for it get their name in one step:
+//
+//     MCSEAL1 / hash of the plan / number of the piece / bytes before the seal / SHA-256 of all that
+#ifndef MOVIECONV_HOST_PIECES_PIECEFILE_H
+#define MOVIECONV_HOST_PIECES_PIECEFILE_H
+
+#include "host/pieces/Plan.h"
+
+#include <cstdint>
+#include <optional>
+#include <string>
+
+namespace movieconv {
+
+/// The place of a piece, beside its plan.
+std::string PiecePath(const std::string& planPath, int number);
+
+/// Seals a written file as a piece of the plan and gives it the piece's name, lastingly. The bytes in it.
+/// Throws Failure, and the file is gone then.
+int64_t SealPiece(const std::string& file, const Plan& plan, const std::string& planPath, int number);
+
+/// What keeps a file from being that piece of the plan, a clause that begins with its name; empty when it is.
+/// Reads all of it.
+std::string FaultOf(const Plan& plan, const std::string& planPath, int number);
+
+/// Whether there is a file of that name at all.
+bool PieceExists(const std::string& planPath, int number);
+
+/// How many pieces stand beside a plan's name, whosever they are.
+int CountPieces(const std::string& planPath);
+
+/// Removes all pieces beside the plan, and what was in the making.
+void RemovePieces(const std::string& planPath);
+
+} // namespace movieconv
+
+#endif

@@ -1,0 +1,205 @@
+#include "host/convert/Failure.h"
+#include "host/pieces/Digest.h"
+#include "host/pieces/Plan.h"
+#include "host/pieces/SettingsText.h"
+#include "host/pieces/WholeFile.h"
+#include "media/MediaRecords.h"
+
+#include <cerrno>
+#include <cstring>
+#include <filesystem>
+#include <fmt/format.h>
+#include <stdexcept>
+
+namespace movieconv {
+namespace {
+
+constexpr int kVersion = 1;
+constexpr int64_t kMostBytes = 16 << 20;
+
+Json AsJson(const Piece& piece) {
+    Json json{{"kind", "pictures"}, {"begin", piece.begin}, {"end", piece.end}, {"pictures", piece.pictures}};
+    if (piece.tick)
+        json["tickBefore"] = *piece.tick;
+    return json;
+}
+
+Json AsJson(const SourceMark& source) {
+    return {{"path", source.path},
+            {"bytes", source.bytes},
+            {"modified", source.modified},
+            {"headSha256", source.head},
+            {"tailSha256", source.tail}};
+}
+
+Json AsJson(const Division& division) {
+    Json json = Json::object();
+    if (division.pieces)
+        json["pieces"] = *division.pieces;
+    if (division.length)
+        json["pieceLength"] = *division.length;
+    return json;
+}
+
+/// Without the hash.
+Json AsJson(const Plan& plan) {
+    Json json;
+    json["version"] = kVersion;
+    json["madeWith"] = plan.versions;
+    json["source"] = AsJson(plan.source);
+    json["output"] = plan.output;
+    json["settings"] = SettingsAsJson(plan.settings);
+    json["division"] = AsJson(plan.division);
+    json["readFromStart"] = plan.fromStart;
+    json["ticksPerSecond"] = kTicksPerSecond;
+    Json pieces = Json::array();
+    int64_t pictures = 0;
+    for (const Piece& piece : plan.pictures) {
+        pieces.push_back(AsJson(piece));
+        pictures += piece.pictures;
+    }
+    pieces.push_back({{"kind", "rest"}, {"pictures", pictures}});
+    json["pieces"] = std::move(pieces);
+    return json;
+}
+
+std::string HashOf(const Json& json) {
+    return DigestOf(json.dump(-1, ' ', false, Json::error_handler_t::replace));
+}
+
+/// Names are bytes; JSON takes UTF-8 only.
+bool IsUtf8(const std::string& text) {
+    try {
+        return !Json(text).dump().empty();
+    } catch (const Json::exception&) {
+        return false;
+    }
+}
+
+[[noreturn]] void Refuse(const std::string& why) {
+    throw std::invalid_argument(why);
+}
+
+int64_t Natural(const Json& json, const char* name) {
+    const Json& value = json.at(name);
+    if (!value.is_number_integer() || value.get<int64_t>() < 0)
+        Refuse(fmt::format("\"{}\" is not a number from 0 on", name));
+    return value.get<int64_t>();
+}
+
+/// A path that names one place, without going back on its way.
+std::string Path(const Json& json) {
+    const auto text = json.get<std::string>();
+    const std::filesystem::path path(text);
+    if (!path.is_absolute() || path.lexically_normal() != path || text.find('\0') != std::string::npos)
+        Refuse(fmt::format("\"{}\" is not an absolute path", text));
+    return text;
+}
+
+SourceMark SourceFrom(const Json& json) {
+    SourceMark source;
+    source.path = Path(json.at("path"));
+    source.bytes = Natural(json, "bytes");
+    source.modified = json.at("modified").get<int64_t>();
+    source.head = json.at("headSha256").get<std::string>();
+    source.tail = json.at("tailSha256").get<std::string>();
+    return source;
+}
+
+Piece PieceFrom(const Json& json) {
+    Piece piece;
+    piece.begin = json.at("begin").get<int64_t>();
+    piece.end = json.at("end").get<int64_t>();
+    piece.pictures = Natural(json, "pictures");
+    if (json.contains("tickBefore"))
+        piece.tick = json.at("tickBefore").get<int64_t>();
+    if (json.at("kind") != "pictures" || piece.end <= piece.begin || piece.pictures < 1)
+        Refuse("a piece holds no pictures");
+    return piece;
+}
+
+std::vector<Piece> PiecesFrom(const Json& json) {
+    if (!json.is_array() || json.size() < 2 || json.size() > std::size_t{kMostPieces} + 1)
+        Refuse(fmt::format("\"pieces\" is not a list of 2 to {}", kMostPieces + 1));
+    std::vector<Piece> pieces;
+    for (std::size_t i = 0; i + 1 < json.size(); ++i) {
+        pieces.push_back(PieceFrom(json.at(i)));
+        if (i > 0 && pieces[i].begin != pieces[i - 1].end)
+            Refuse(fmt::format("piece {} does not begin where the one before it ends", i));
+    }
+    if (json.back().at("kind") != "rest")
+        Refuse("the last piece is not the rest");
+    return pieces;
+}
+
+Plan PlanFrom(const Json& json) {
+    if (!json.is_object() || !json.contains("version"))
+        Refuse("it is not a plan");
+    if (json.at("version") != kVersion)
+        Refuse(fmt::format("it has version {}, this program knows version {}", json.at("version").dump(),
+                           kVersion));
+    Plan plan;
+    plan.pictures = PiecesFrom(json.at("pieces"));
+    plan.versions = json.at("madeWith").get<std::map<std::string, std::string>>();
+    plan.source = SourceFrom(json.at("source"));
+    plan.output = Path(json.at("output"));
+    plan.settings = SettingsFromJson(json.at("settings"));
+    plan.fromStart = json.at("readFromStart").get<bool>();
+    const Json& division = json.at("division");
+    if (division.contains("pieces"))
+        plan.division.pieces = division.at("pieces").get<int>();
+    if (division.contains("pieceLength"))
+        plan.division.length = division.at("pieceLength").get<double>();
+    plan.hash = HashOf(AsJson(plan));
+    if (json.at("hash") != plan.hash)
+        Refuse("it was changed or cut since it was written");
+    return plan;
+}
+
+} // namespace
+
+Plan ReadPlan(const std::string& path) {
+    const std::string text = ReadWhole(path, kMostBytes);
+    try {
+        return PlanFrom(Json::parse(text));
+    } catch (const Json::parse_error&) {
+        throw Failure(Category::kRequest, fmt::format("\"{}\" is not a plan, or only a part of one", path));
+    } catch (const Json::exception& error) {
+        throw Failure(Category::kRequest, fmt::format("\"{}\" is not a plan: {}", path, error.what()));
+    } catch (const std::invalid_argument& error) {
+        throw Failure(Category::kRequest, fmt::format("\"{}\" is not a plan: {}", path, error.what()));
+    }
+}
+
+void WritePlan(const std::string& path, Plan& plan) {
+    for (const std::string& name : {plan.source.path, plan.output})
+        if (!IsUtf8(name))
+            throw Failure(Category::kRequest,
+                          fmt::format("\"{}\" cannot stand in a plan: its name is not UTF-8", name));
+    Json json = AsJson(plan);
+    plan.hash = HashOf(json);
+    json["hash"] = plan.hash;
+    WriteWhole(path, json.dump(2) + "\n");
+}
+
+std::string Difference(const Plan& before, const Plan& now) {
+    const Json one = AsJson(before);
+    const Json other = AsJson(now);
+    const auto text = [](const Json& json, const std::string& key) {
+        return json.contains(key) ? json.at(key).dump() : std::string("nothing");
+    };
+    std::string what;
+    for (const char* part : {"madeWith", "source", "settings", "division"}) {
+        Json keys = one.at(part);
+        keys.update(other.at(part));
+        for (const auto& [key, value] : keys.items())
+            if (text(one.at(part), key) != text(other.at(part), key))
+                what += fmt::format("{}{} {} was {}, now {}", what.empty() ? "" : "; ", part, key,
+                                    text(one.at(part), key), text(other.at(part), key));
+    }
+    if (before.output != now.output)
+        what += fmt::format("{}the output was \"{}\"", what.empty() ? "" : "; ", before.output);
+    return what;
+}
+
+} // namespace movieconv

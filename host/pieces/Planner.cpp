@@ -1,0 +1,250 @@
+#include "api/MovieConv.h"
+#include "host/convert/CodecPlan.h"
+#include "host/convert/EncodePlan.h"
+#include "host/convert/Engine.h"
+#include "host/convert/Failure.h"
+#include "host/convert/SizePlan.h"
+#include "host/convert/Sources.h"
+#include "host/pieces/Plan.h"
+#include "host/source/MediaTime.h"
+#include "media/MediaWriter.h"
+#include "writer/WriterStatus.h"
+
+extern "C" {
+#include <libavcodec/avcodec.h>
+#include <libavformat/avformat.h>
+#include <libswresample/swresample.h>
+#include <libswscale/swscale.h>
+}
+
+#include <algorithm>
+#include <filesystem>
+#include <fmt/format.h>
+#include <utility>
+
+namespace movieconv {
+namespace {
+
+constexpr double kLeastPiece = 60; // seconds, unless asked for otherwise
+
+/// The stamps of all pictures that are converted, rising, and where the last one ends.
+struct Stamps {
+    std::vector<int64_t> times;
+    int64_t end = 0;
+    bool clockJumps = false;
+};
+
+std::string VersionText(unsigned version) {
+    return fmt::format("{}.{}.{}", version >> 16, version >> 8 & 0xFF, version & 0xFF);
+}
+
+/// Why no pieces can be made of what is asked for; empty when they can.
+std::string Obstacle(const Request& request, const Division& division) {
+    if (request.split)
+        return "clips are not made of pieces: leave one of both out";
+    if (request.noVideo || request.preferences.noVideo || ChooseFormat(request).bHasVideo == 0)
+        return "pieces are made of pictures: sound alone is converted undivided";
+    if (request.playlists)
+        return "a playlist cannot be converted in pieces: the plan would not notice when its parts change";
+    if (division.pieces && (*division.pieces < 1 || *division.pieces > kMostPieces))
+        return fmt::format("a movie is divided into 1 to {} pieces", kMostPieces);
+    if (division.length && *division.length < 0.001)
+        return "a piece is at least 0.001 seconds long";
+    return {};
+}
+
+Request StampRequest(const Plan& plan) {
+    Request request = plan.settings;
+    request.input = plan.source.path;
+    request.output = plan.output;
+    request.piece.emplace().pictures = false;
+    return request;
+}
+
+std::optional<Stamps> ReadStamps(Movie& movie, const Request& request, bool (*stopped)(void*),
+                                 void* context) {
+    constexpr std::size_t kAskEvery = 4096;
+    VideoDecoder& pictures = *movie.Pictures();
+    if (request.begin > 0)
+        pictures.Seek(request.begin, 1);
+    if (request.length)
+        movie.EndPicturesAt(request.begin + *request.length);
+    Stamps stamps;
+    for (const VideoImage* picture = pictures.GetCurrentImage(); picture != nullptr;
+         picture = pictures.DecodeNext(1) > 0 ? pictures.GetCurrentImage() : nullptr) {
+        stamps.times.push_back(picture->llTime);
+        stamps.end = picture->llTime + picture->nDuration;
+        if (stamps.times.size() % kAskEvery == 0 && stopped != nullptr && stopped(context))
+            return std::nullopt;
+    }
+    if (request.length)
+        stamps.end = std::min(stamps.end, ToMediaTime(request.begin + *request.length));
+    stamps.clockJumps = movie.ClockJumps() > 0;
+    const std::string& path = request.input;
+    if (const std::string error = movie.ReadError(); !error.empty())
+        throw Failure(Category::kSource, fmt::format("reading \"{}\" failed: {}", path, error));
+    if (movie.UnstampedPictures() > 0)
+        throw Failure(
+            Category::kSource,
+            fmt::format("\"{}\" does not tell when its pictures are shown; it can only be converted "
+                        "undivided",
+                        path));
+    if (stamps.times.empty())
+        throw Failure(Category::kSource, fmt::format("\"{}\" holds no pictures to convert", path));
+    return stamps;
+}
+
+/// The numbers of the pictures with which pieces begin.
+std::vector<std::size_t> FirstPictures(const Stamps& stamps, const Division& division) {
+    const auto count = static_cast<int64_t>(stamps.times.size());
+    const int64_t origin = stamps.times.front();
+    std::vector<std::size_t> firsts{0};
+    const auto add = [&](std::size_t picture) {
+        if (picture > firsts.back() && picture < stamps.times.size())
+            firsts.push_back(picture);
+    };
+    if (division.pieces) {
+        for (int64_t i = 1; i < *division.pieces; ++i)
+            add(static_cast<std::size_t>(i * count / *division.pieces));
+        return firsts;
+    }
+    const int64_t whole = stamps.end - origin;
+    const int64_t pieces = std::max<int64_t>(1, whole / ToMediaTime(kLeastPiece));
+    const int64_t length = division.length ? ToMediaTime(*division.length) : (whole + pieces - 1) / pieces;
+    while (true) {
+        // From where the last one begins, so that a picture that stands for long makes no empty piece.
+        const int64_t passed = (stamps.times[firsts.back()] - origin) / length;
+        const auto next =
+            std::lower_bound(stamps.times.begin(), stamps.times.end(), origin + (passed + 1) * length);
+        if (next == stamps.times.end())
+            return firsts;
+        add(static_cast<std::size_t>(next - stamps.times.begin()));
+    }
+}
+
+std::vector<std::optional<int64_t>> TicksBefore(const Request& request, Movie& movie, const Stamps& stamps,
+                                                const SourceInfo& source) {
+    const Engine engine = MakeEngine(request, source, movie.Pictures(), nullptr);
+    EncodeParam param{};
+    MCGetEncodeParam(engine.get(), &param);
+    const VideoFormat format = movie.Pictures()->GetVideoInfo()->format;
+    std::vector<int64_t> times = stamps.times;
+    for (int64_t& time : times)
+        time -= stamps.times.front();
+    std::vector<int64_t> ticks(times.size());
+    if (MWPlanTicks(&param, &format, times.data(), static_cast<int64_t>(times.size()), ticks.data()) == 0)
+        throw Failure(Category::kInternal, "the pictures cannot be placed in the output");
+    std::vector<std::optional<int64_t>> before;
+    for (const int64_t tick : ticks)
+        before.push_back(tick == kWriterNoTick ? std::nullopt : std::optional(tick));
+    return before;
+}
+
+} // namespace
+
+std::map<std::string, std::string> CurrentVersions() {
+    return {{"movieconv", fmt::format("{}", VersionText(MWGetVersion()))},
+            {"libavcodec", VersionText(avcodec_version())},
+            {"libavformat", VersionText(avformat_version())},
+            {"libavutil", VersionText(avutil_version())},
+            {"libswscale", VersionText(swscale_version())},
+            {"libswresample", VersionText(swresample_version())}};
+}
+
+Plan BeginPlan(const Request& request, const Division& division) {
+    if (const std::string obstacle = Obstacle(request, division); !obstacle.empty())
+        throw Failure(Category::kRequest, obstacle);
+    Plan plan;
+    plan.versions = CurrentVersions();
+    plan.source = MarkOf(request.input);
+    plan.output = std::filesystem::absolute(request.output).lexically_normal().string();
+    plan.division = division;
+    plan.settings = request.maxSize ? FitIntoSize(request, LookAtSource(request)) : request;
+    if (const SourceInfo source = request.detectCrop ? LookAtSource(request) : SourceInfo{}; source.pictures)
+        plan.settings.crop = source.pictures->crop;
+    plan.settings.detectCrop = false;
+    plan.settings.format = ChooseFormat(request).fccFormat;
+    plan.settings.maxSize.reset();
+    plan.settings.preview.reset();
+    plan.settings.input.clear();
+    plan.settings.output.clear();
+    return plan;
+}
+
+std::optional<Plan> MakePlan(const Request& request, const Division& division, bool (*stopped)(void*),
+                             void* context) {
+    Plan plan = BeginPlan(request, division);
+    Request reading = StampRequest(plan);
+    Request pictures = reading;
+    pictures.noAudio = true;
+    Movie movie = OpenMovie(pictures);
+    if (!movie.Info().pictures)
+        throw Failure(Category::kSource,
+                      fmt::format("\"{}\" holds no pictures that could be divided", request.input));
+    LengthToConvert(pictures, movie.Info()); // refuses a begin behind the end
+    const std::optional<Stamps> stamps = ReadStamps(movie, pictures, stopped, context);
+    if (!stamps)
+        return std::nullopt;
+    if (MarkOf(plan.source.path) != plan.source)
+        throw Failure(Category::kSource,
+                      fmt::format("\"{}\" was written to while it was read", plan.source.path));
+    plan.fromStart = stamps->clockJumps;
+    const std::vector<std::size_t> firsts = FirstPictures(*stamps, division);
+    if (firsts.size() > std::size_t{kMostPieces})
+        throw Failure(Category::kRequest, fmt::format("that makes {} pieces; at most {} can be made",
+                                                      firsts.size(), kMostPieces));
+    const auto ticks = TicksBefore(pictures, movie, *stamps, movie.Info());
+    for (std::size_t i = 0; i < firsts.size(); ++i) {
+        const std::size_t next = i + 1 < firsts.size() ? firsts[i + 1] : stamps->times.size();
+        Piece piece;
+        piece.begin = stamps->times[firsts[i]];
+        piece.end =
+            next < stamps->times.size() ? stamps->times[next] : std::max(stamps->end, piece.begin + 1);
+        piece.pictures = static_cast<int64_t>(next - firsts[i]);
+        piece.tick = ticks[firsts[i]];
+        plan.pictures.push_back(piece);
+    }
+    return plan;
+}
+
+std::string TellBitRate(const Plan& plan) {
+    Request request = plan.settings;
+    request.input = plan.source.path;
+    request.output = plan.output;
+    if (!HasRates(request, ChooseFormat(request), LookAtSource(request)))
+        return {};
+    const double seconds = ToSeconds(plan.pictures.back().end - plan.pictures.front().begin) /
+                           static_cast<double>(plan.pictures.size());
+    return fmt::format(
+        "the bit rate begins anew in each of {} pieces of {:.0f} s: pieces below 20 s make the "
+        "output larger by more than 4 %; a constant quality does not",
+        plan.pictures.size(), seconds);
+}
+
+Request RequestFor(const Plan& plan, int number, const std::string& output) {
+    Request request = plan.settings;
+    request.input = plan.source.path;
+    request.output = output;
+    request.overwrite = true; // whatever was left there
+    request.keepPartial = false;
+    request.encoderThreads = 1; // more of them may change the bytes from run to run
+    PieceCut cut;
+    cut.pictures = !plan.IsRest(number);
+    cut.origin = plan.pictures.front().begin;
+    cut.fromStart = plan.fromStart;
+    if (cut.pictures) {
+        const auto place = static_cast<std::size_t>(number);
+        const Piece& piece = plan.pictures[place];
+        cut.begin = piece.begin;
+        cut.end = piece.end;
+        cut.last = place + 1 == plan.pictures.size();
+        cut.tick = piece.tick;
+        if (number > 0)
+            request.begin = ToSeconds(piece.begin);
+        request.length = ToSeconds(piece.end - piece.begin);
+    }
+    request.piece = cut;
+    return request;
+}
+
+} // namespace movieconv

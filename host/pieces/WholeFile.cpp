@@ -1,0 +1,119 @@
+#include "host/pieces/WholeFile.h"
+
+#include "host/convert/Failure.h"
+#include "text/Path.h"
+
+#include <array>
+#include <cerrno>
+#include <cstdio>
+#include <cstring>
+#include <fcntl.h>
+#include <fmt/format.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+namespace movieconv {
+namespace {
+
+/// Closes it in the end, unless that was done.
+class Descriptor {
+public:
+    explicit Descriptor(int number) : number_(number) {}
+    ~Descriptor() { Close(); }
+    Descriptor(const Descriptor&) = delete;
+    Descriptor& operator=(const Descriptor&) = delete;
+    int Number() const { return number_; }
+    bool Close() {
+        const int number = number_;
+        number_ = -1;
+        return number < 0 || close(number) == 0;
+    }
+
+private:
+    int number_;
+};
+
+Failure CannotWrite(const std::string& path) {
+    const bool full = errno == ENOSPC || errno == EDQUOT;
+    return {full ? Category::kNoSpace : Category::kOutput,
+            fmt::format("cannot write \"{}\": {}", path, std::strerror(errno))};
+}
+
+bool WriteAll(int descriptor, std::string_view text) {
+    while (!text.empty()) {
+        const ssize_t count = write(descriptor, text.data(), text.size());
+        if (count < 0 && errno == EINTR)
+            continue;
+        if (count < 0)
+            return false;
+        text.remove_prefix(static_cast<std::size_t>(count));
+    }
+    return true;
+}
+
+} // namespace
+
+std::string ReadWhole(const std::string& path, int64_t most) {
+    const auto refuse = [&](const std::string& why) {
+        return Failure(Category::kSource, fmt::format("cannot read \"{}\": {}", path, why));
+    };
+    const Descriptor file(open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK));
+    struct stat status {};
+    if (file.Number() < 0 || fstat(file.Number(), &status) != 0)
+        throw refuse(std::strerror(errno));
+    if (!S_ISREG(status.st_mode))
+        throw refuse("it is not a file");
+    std::string text;
+    std::array<char, 65536> buffer{};
+    for (;;) {
+        const ssize_t count = read(file.Number(), buffer.data(), buffer.size());
+        if (count < 0 && errno == EINTR)
+            continue;
+        if (count < 0)
+            throw refuse(std::strerror(errno));
+        if (count == 0)
+            return text;
+        text.append(buffer.data(), static_cast<std::size_t>(count));
+        if (static_cast<int64_t>(text.size()) > most)
+            throw refuse("it is too large");
+    }
+}
+
+void WriteWhole(const std::string& path, std::string_view text) {
+    const std::string making = NameInTheMaking(path);
+    Descriptor file(open(making.c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0666));
+    const bool written = file.Number() >= 0 && WriteAll(file.Number(), text) && fsync(file.Number()) == 0 &&
+                         file.Close() && RenameLastingly(making, path);
+    if (written)
+        return;
+    const Failure failure = CannotWrite(path);
+    unlink(making.c_str());
+    throw failure;
+}
+
+void AppendWhole(const std::string& path, std::string_view text) {
+    Descriptor file(open(path.c_str(), O_WRONLY | O_CREAT | O_APPEND | O_CLOEXEC, 0666));
+    if (file.Number() < 0 || !WriteAll(file.Number(), text) || fsync(file.Number()) != 0 || !file.Close())
+        throw CannotWrite(path);
+}
+
+bool RenameLastingly(const std::string& from, const std::string& to) {
+    if (std::rename(from.c_str(), to.c_str()) != 0)
+        return false;
+    const Descriptor folder(open(text::FolderOf(to).c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC));
+    if (folder.Number() >= 0)
+        fsync(folder.Number()); // some file systems cannot; the name is there all the same
+    return true;
+}
+
+std::string NameInTheMaking(const std::string& path) {
+    std::array<char, 65> host{};
+    gethostname(host.data(), host.size() - 1);
+    return fmt::format("{}{}-{}", MakingPrefix(path), host.data(), getpid());
+}
+
+std::string MakingPrefix(const std::string& path) {
+    return path + ".making-";
+}
+
+} // namespace movieconv

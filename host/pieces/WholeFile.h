@@ -1,0 +1,31 @@
+// Small files that are there whole or not at all.
+#ifndef MOVIECONV_HOST_PIECES_WHOLEFILE_H
+#define MOVIECONV_HOST_PIECES_WHOLEFILE_H
+
+#include <cstdint>
+#include <string>
+#include <string_view>
+
+namespace movieconv {
+
+/// All of a file. Throws Failure (kSource) when it cannot be read or is larger than `most` bytes.
+std::string ReadWhole(const std::string& path, int64_t most);
+
+/// Writes it beside and gives it the name, synced; what stood there is replaced. Throws Failure.
+void WriteWhole(const std::string& path, std::string_view text);
+
+/// Writes behind what a file holds, and to the disk; makes it when there is none. Throws Failure.
+void AppendWhole(const std::string& path, std::string_view text);
+
+/// Gives a synced file its name, lastingly. False, with errno set, when it fails.
+bool RenameLastingly(const std::string& from, const std::string& to);
+
+/// A name beside `path` that no other process on any machine takes for the same purpose.
+std::string NameInTheMaking(const std::string& path);
+
+/// The start of such names.
+std::string MakingPrefix(const std::string& path);
+
+} // namespace movieconv
+
+#endif

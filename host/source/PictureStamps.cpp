@@ -1,0 +1,117 @@
+#include "host/source/PictureStamps.h"
+
+#include "host/source/MediaTime.h"
+#include "host/source/SourceTime.h"
+
+#include <algorithm>
+
+namespace movieconv {
+namespace {
+
+/// Pictures that a codec may decode before one that is shown earlier; twice what the standards allow.
+constexpr std::size_t kMostReordered = 32;
+
+} // namespace
+
+PictureStamps::PictureStamps(const Source& source, Demuxer& demuxer)
+    : reader_(source.Reader()),
+      demuxer_(demuxer),
+      stream_(source.PictureStream()->index),
+      timeBase_(source.PictureStream()->time_base),
+      codec_(source.PictureStream()->codecpar->codec_id),
+      repair_(ToMediaTime(1 / source.Info().pictures->frameRate)) {
+    const PictureStreamInfo& pictures = *source.Info().pictures;
+    info_.format = {pictures.width, pictures.height, pictures.frameRate, pictures.duration};
+}
+
+double PictureStamps::Seek(double seconds, int /*mode*/) {
+    begin_ = ToMediaTime(seconds);
+    demuxer_.Seek(seconds);
+    return seconds;
+}
+
+void PictureStamps::EndAt(double seconds) {
+    end_ = ToMediaTime(seconds);
+}
+
+VideoImage* PictureStamps::GetCurrentImage() {
+    if (!started_) {
+        started_ = true;
+        ended_ = !Advance();
+    }
+    return ended_ ? nullptr : &image_;
+}
+
+int PictureStamps::DecodeNext(int /*mode*/) {
+    ended_ = ended_ || !Advance();
+    return ended_ ? 0 : 1;
+}
+
+/// As PictureDecoder delivers.
+bool PictureStamps::Advance() {
+    while (std::optional<StampRepair::Stamp> stamp = NextSettled()) {
+        if (end_ && stamp->time >= *end_)
+            return false;
+        if (begin_ && stamp->time + stamp->duration <= *begin_)
+            continue;
+        if (const int64_t begin = begin_.value_or(0); first_ && (begin_ || stamp->time > begin)) {
+            stamp->duration += stamp->time - begin;
+            stamp->time = begin;
+        }
+        first_ = false;
+        image_ = {};
+        image_.nType = kMediaTypePicture;
+        image_.nWidth = info_.format.nWidth;
+        image_.nHeight = info_.format.nHeight;
+        image_.llTime = image_.llTime2 = stamp->time;
+        TellSourceTime(image_.reserved, stamp->time);
+        image_.nDuration = static_cast<int32_t>(std::min<int64_t>(stamp->duration, INT32_MAX));
+        return true;
+    }
+    ranDry_ = true;
+    return false;
+}
+
+std::optional<StampRepair::Stamp> PictureStamps::NextSettled() {
+    while (!settledAll_) {
+        const std::optional<int64_t> shown = NextShown();
+        settledAll_ = !shown;
+        if (const auto settled = shown ? repair_.Push(shown) : repair_.Finish())
+            return settled;
+    }
+    return std::nullopt;
+}
+
+/// The next stamp in the order in which pictures are shown.
+std::optional<int64_t> PictureStamps::NextShown() {
+    while (!readAll_ && decoded_.size() <= kMostReordered) {
+        const av::Packet packet = demuxer_.Take(stream_);
+        readAll_ = !packet;
+        if (packet && IsShown(*packet))
+            decoded_.push(reader_.MediaTime(packet->pts, timeBase_));
+    }
+    if (decoded_.empty())
+        return std::nullopt;
+    const int64_t next = decoded_.top();
+    decoded_.pop();
+    return next;
+}
+
+/// Whether a packet becomes a picture that is shown, at a time that it tells.
+bool PictureStamps::IsShown(const AVPacket& packet) {
+    constexpr int kVp8ShowFrame = 0x10;
+    if ((packet.flags & AV_PKT_FLAG_DISCARD) != 0 || packet.size <= 0)
+        return false;
+    if (codec_ == AV_CODEC_ID_VP8 && (packet.data[0] & kVp8ShowFrame) == 0)
+        return false;
+    if (packet.pts == AV_NOPTS_VALUE) {
+        ++unstamped_;
+        return false;
+    }
+    if (!firstKey_ && (packet.flags & AV_PKT_FLAG_KEY) != 0)
+        firstKey_ = packet.pts;
+    return firstKey_ &&
+           packet.pts >= *firstKey_; // what is shown earlier builds on pictures that are not there
+}
+
+} // namespace movieconv

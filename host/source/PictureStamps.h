@@ -1,0 +1,71 @@
+// When a movie's pictures are shown, without decoding them: the engine's source of pictures where only their
+// stamps matter.
+#ifndef MOVIECONV_HOST_SOURCE_PICTURESTAMPS_H
+#define MOVIECONV_HOST_SOURCE_PICTURESTAMPS_H
+
+#include "host/source/Demuxer.h"
+#include "host/source/Source.h"
+#include "host/source/StampRepair.h"
+#include "media/Decoders.h"
+
+#include <atomic>
+#include <cstdint>
+#include <functional>
+#include <optional>
+#include <queue>
+#include <vector>
+
+namespace movieconv {
+
+/// Hands out the pictures that PictureDecoder would, with the same stamps and without planes.
+class PictureStamps final : public VideoDecoder {
+public:
+    PictureStamps(const Source& source, Demuxer& demuxer);
+
+    VideoSourceInfo* GetVideoInfo() override { return &info_; }
+    double Seek(double seconds, int mode) override;
+    VideoImage* GetCurrentImage() override;
+    int DecodeNext(int mode) override;
+
+    /// Leaves out the pictures from that time on. Only before the first is taken.
+    void EndAt(double seconds);
+
+    /// Whether the source's last picture was handed out. Any thread.
+    bool RanDry() const { return ranDry_; }
+
+    /// Pictures of which the source does not tell when they are shown.
+    int64_t Unstamped() const { return unstamped_; }
+
+    /// Pictures whose stamp was put right.
+    int64_t Repaired() const { return repair_.Repaired(); }
+
+private:
+    bool Advance();
+    std::optional<StampRepair::Stamp> NextSettled();
+    std::optional<int64_t> NextShown();
+    bool IsShown(const AVPacket& packet);
+
+    const MovieReader& reader_;
+    Demuxer& demuxer_;
+    const int stream_;
+    const AVRational timeBase_;
+    const AVCodecID codec_;
+    VideoSourceInfo info_{};
+    StampRepair repair_;
+    std::priority_queue<int64_t, std::vector<int64_t>, std::greater<>> decoded_; // of packets, in media time
+    std::optional<int64_t> firstKey_; // when the first picture that can be decoded is shown
+    std::optional<int64_t> begin_;
+    std::optional<int64_t> end_;
+    bool readAll_ = false;
+    bool settledAll_ = false;
+    bool first_ = true;
+    bool started_ = false;
+    bool ended_ = false;
+    VideoImage image_{};
+    int64_t unstamped_ = 0;
+    std::atomic<bool> ranDry_{false};
+};
+
+} // namespace movieconv
+
+#endif
