@@ -44,6 +44,12 @@ int64_t AvailableMemory() {
     return 0;
 }
 
+Request RequestOf(const PieceOrder& order, const Plan& plan, int number, const std::string& file) {
+    Request request = RequestFor(plan, number, file);
+    request.onFull = order.onFull;
+    return request;
+}
+
 /// What making one piece takes at most: pictures waiting for each other, and the encoder's view of its
 /// future.
 int64_t MemoryPerPiece(const PictureStreamInfo& pictures) {
@@ -66,7 +72,7 @@ public:
           plan_(plan),
           number_(number),
           file_(NameInTheMaking(PiecePath(foreman.order_.planPath, number))),
-          job_(RequestFor(plan, number, file_), *this) {}
+          job_(RequestOf(foreman.order_, plan, number, file_), *this) {}
 
     Job& Conversion() { return job_; }
 
@@ -181,6 +187,11 @@ const Verdict* Foreman::Result() const {
     return ended_ ? &verdict_ : nullptr;
 }
 
+void Foreman::Wait() {
+    std::unique_lock lock(mutex_);
+    end_.wait(lock, [this] { return ended_; });
+}
+
 void Foreman::Run() noexcept {
     Verdict verdict;
     try {
@@ -198,6 +209,7 @@ void Foreman::Run() noexcept {
         verdict_ = std::move(verdict);
         ended_ = true;
     }
+    end_.notify_all();
     try {
         outlet_.Ended(verdict_);
     } catch (const std::bad_alloc&) { // Result tells it

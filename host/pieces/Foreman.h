@@ -11,6 +11,7 @@
 #include "host/pieces/Plan.h"
 
 #include <atomic>
+#include <condition_variable>
 #include <deque>
 #include <memory>
 #include <mutex>
@@ -30,7 +31,8 @@ struct PieceOrder {
     bool join = false;              ///< And when all are there, make the output of them.
     bool replace = false;           ///< The output may replace a file.
     bool keepPieces = false;        ///< Leave them and the plan where they are afterwards.
-    int jobs = 1;                   ///< Pieces at once; 0: as many as processors and memory allow.
+    OnFull onFull = OnFull::kStop;
+    int jobs = 1; ///< Pieces at once; 0: as many as processors and memory allow.
 };
 
 /// The plan that a conversion in pieces keeps beside its output.
@@ -47,6 +49,9 @@ public:
     void Resume() override;
     void Stop() override;
     const Verdict* Result() const override;
+
+    /// Waits until it has ended. The last news may still wait in the loop.
+    void Wait();
 
 private:
     class Task;
@@ -77,6 +82,7 @@ private:
 
     mutable std::mutex mutex_;                 // guards what follows
     std::vector<std::unique_ptr<Task>> tasks_; // only the foreman's thread changes the list
+    std::condition_variable end_;
     bool ended_ = false;
     Verdict verdict_;
 

@@ -41,7 +41,7 @@ Request JoinRequest(const Plan& plan, bool replace) {
     Request request = plan.settings;
     request.input = plan.source.path;
     request.output = plan.output;
-    request.overwrite = request.overwrite || replace;
+    request.overwrite = replace;
     request.keepPartial = false; // it can be joined again
     request.bitExact = true;     // the multiplexers' numbers of their own are drawn by lot
     return request;

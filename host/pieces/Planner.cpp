@@ -30,6 +30,7 @@ constexpr double kLeastPiece = 60; // seconds, unless asked for otherwise
 /// The stamps of all pictures that are converted, rising, and where the last one ends.
 struct Stamps {
     std::vector<int64_t> times;
+    std::vector<bool> repaired; ///< Whether that is not the source's own stamp.
     int64_t end = 0;
     bool clockJumps = false;
 };
@@ -73,6 +74,7 @@ std::optional<Stamps> ReadStamps(Movie& movie, const Request& request, bool (*st
     for (const VideoImage* picture = pictures.GetCurrentImage(); picture != nullptr;
          picture = pictures.DecodeNext(1) > 0 ? pictures.GetCurrentImage() : nullptr) {
         stamps.times.push_back(picture->llTime);
+        stamps.repaired.push_back(movie.StampIsRepaired());
         stamps.end = picture->llTime + picture->nDuration;
         if (stamps.times.size() % kAskEvery == 0 && stopped != nullptr && stopped(context))
             return std::nullopt;
@@ -94,12 +96,23 @@ std::optional<Stamps> ReadStamps(Movie& movie, const Request& request, bool (*st
     return stamps;
 }
 
+/// Whether a piece that begins with the picture sees the same stamps as who reads from the start: where
+/// stamps are put right, they depend on those before.
+bool IsCertain(const Stamps& stamps, std::size_t picture) {
+    const auto isOwn = [&](std::size_t which) {
+        return which >= stamps.repaired.size() || !stamps.repaired[which];
+    };
+    return isOwn(picture) && isOwn(picture + 1) && (picture == 0 || isOwn(picture - 1));
+}
+
 /// The numbers of the pictures with which pieces begin.
 std::vector<std::size_t> FirstPictures(const Stamps& stamps, const Division& division) {
     const auto count = static_cast<int64_t>(stamps.times.size());
     const int64_t origin = stamps.times.front();
     std::vector<std::size_t> firsts{0};
     const auto add = [&](std::size_t picture) {
+        while (picture < stamps.times.size() && !IsCertain(stamps, picture))
+            ++picture;
         if (picture > firsts.back() && picture < stamps.times.size())
             firsts.push_back(picture);
     };
@@ -111,14 +124,14 @@ std::vector<std::size_t> FirstPictures(const Stamps& stamps, const Division& div
     const int64_t whole = stamps.end - origin;
     const int64_t pieces = std::max<int64_t>(1, whole / ToMediaTime(kLeastPiece));
     const int64_t length = division.length ? ToMediaTime(*division.length) : (whole + pieces - 1) / pieces;
-    while (true) {
+    for (std::size_t last = 0;; last = firsts.back()) {
         // From where the last one begins, so that a picture that stands for long makes no empty piece.
-        const int64_t passed = (stamps.times[firsts.back()] - origin) / length;
+        const int64_t passed = (stamps.times[last] - origin) / length;
         const auto next =
             std::lower_bound(stamps.times.begin(), stamps.times.end(), origin + (passed + 1) * length);
-        if (next == stamps.times.end())
-            return firsts;
         add(static_cast<std::size_t>(next - stamps.times.begin()));
+        if (firsts.back() == last)
+            return firsts;
     }
 }
 

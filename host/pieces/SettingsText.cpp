@@ -211,8 +211,6 @@ void Asked(Archive& archive, Fields& request) {
     archive("noAudio", request.noAudio);
     archive("begin", request.begin);
     archive("length", request.length);
-    archive("overwrite", request.overwrite);
-    archive("onFull", request.onFull);
 }
 
 } // namespace

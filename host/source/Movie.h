@@ -78,6 +78,7 @@ public:
     int64_t DamagedPictures() const { return pictures_ ? pictures_->Damaged() : 0; }
 
     /// Pictures without a stamp, where only stamps are read, and jumps of the clock. Once the pictures ended.
+    bool StampIsRepaired() const { return stamps_ && stamps_->IsRepaired(); } // of the current picture
     int64_t UnstampedPictures() const { return stamps_ ? stamps_->Unstamped() : 0; }
     int ClockJumps() const { return demuxer_.ClockJumps(); }
 

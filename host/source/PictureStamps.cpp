@@ -76,8 +76,11 @@ std::optional<StampRepair::Stamp> PictureStamps::NextSettled() {
     while (!settledAll_) {
         const std::optional<int64_t> shown = NextShown();
         settledAll_ = !shown;
-        if (const auto settled = shown ? repair_.Push(shown) : repair_.Finish())
+        const int before = repair_.Repaired();
+        if (const auto settled = shown ? repair_.Push(shown) : repair_.Finish()) {
+            repaired_ = repair_.Repaired() != before;
             return settled;
+        }
     }
     return std::nullopt;
 }

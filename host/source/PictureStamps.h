@@ -36,8 +36,8 @@ public:
     /// Pictures of which the source does not tell when they are shown.
     int64_t Unstamped() const { return unstamped_; }
 
-    /// Pictures whose stamp was put right.
-    int64_t Repaired() const { return repair_.Repaired(); }
+    /// Whether the current picture's stamp is not its own, but was put right.
+    bool IsRepaired() const { return repaired_; }
 
 private:
     bool Advance();
@@ -59,6 +59,7 @@ private:
     bool readAll_ = false;
     bool settledAll_ = false;
     bool first_ = true;
+    bool repaired_ = false;
     bool started_ = false;
     bool ended_ = false;
     VideoImage image_{};

@@ -19,6 +19,7 @@ std::unique_ptr<Work> MakeWork(const Options& options, Observer& observer, Loop 
         return std::make_unique<Job>(options.request, observer, std::move(loop));
     PieceOrder order;
     order.keepPieces = options.keepPieces;
+    order.onFull = options.request.onFull;
     order.replace = options.request.overwrite;
     order.join = options.task != Task::kPiece;
     if (options.task == Task::kConvert) {
