@@ -1,6 +1,7 @@
 #include "writer/FilePlan.h"
 
 #include "media/MediaRecords.h"
+#include "writer/PaletteMaker.h"
 #include "writer/WriterFailure.h"
 
 extern "C" {
@@ -111,6 +112,14 @@ PictureSettings MakePictureSettings(const EncodeParam& param, const VideoFormat&
     return settings;
 }
 
+/// How colours are turned to RGB: as told, or by the usual guess.
+int RgbMatrix(const PictureSettings& settings) {
+    constexpr int kLeastHdHeight = 720;
+    if (settings.matrix != AVCOL_SPC_UNSPECIFIED)
+        return settings.matrix;
+    return settings.height >= kLeastHdHeight ? SWS_CS_ITU709 : SWS_CS_ITU601;
+}
+
 PicturePlan MakePicturePlan(const EncodeParam& param, const VideoFormat& source, const Container& container,
                             const WriterOptions& options) {
     PicturePlan plan{};
@@ -139,6 +148,10 @@ PicturePlan MakePicturePlan(const EncodeParam& param, const VideoFormat& source,
     }
     if (plan.codec->format == AV_PIX_FMT_YUVJ420P)
         plan.picture.fullRange = true;
+    plan.picture.matrix = RgbMatrix(plan.settings);
+    plan.toPalette = plan.codec->format == AV_PIX_FMT_PAL8;
+    if (plan.toPalette)
+        plan.picture.format = kPaletteSource;
     plan.settings.fullRange = plan.picture.fullRange;
     plan.settings.inOrder = container.kind == ContainerKind::kSteadyRate;
     plan.clock = MakePictureClock(plan.settings.rate, container.kind == ContainerKind::kSteadyRate);

@@ -23,6 +23,7 @@ struct PicturePlan {
     const PictureCodec* codec;
     PictureSettings settings;
     PictureScaler::Output picture;
+    bool toPalette;          ///< The encoder gets at most 256 colours a picture, chosen for each.
     AVRational sourceAspect; ///< Shape of the source's pixels.
     bool sourceFullRange;
     bool stretch;

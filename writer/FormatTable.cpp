@@ -25,6 +25,7 @@ constexpr uint32_t kAv1 = FourCC("AV01");
 constexpr uint32_t kFfv1 = FourCC("FFV1");
 constexpr uint32_t kMpeg2 = FourCC("MPG2");
 constexpr uint32_t kFlv1 = FourCC("FLV1");
+constexpr uint32_t kGif = FourCC("GIF ");
 constexpr uint32_t kAac = FourCC("AAC ");
 constexpr uint32_t kMp3 = FourCC("MP3 ");
 constexpr uint32_t kAc3 = FourCC("AC3 ");
@@ -38,6 +39,7 @@ constexpr uint32_t kPcm = FourCC("PCM ");
 // clang-format off
 constexpr AVPixelFormat kPlanar = AV_PIX_FMT_YUV420P;
 constexpr AVPixelFormat kPlanarFull = AV_PIX_FMT_YUVJ420P;
+constexpr AVPixelFormat kPalette = AV_PIX_FMT_PAL8;
 
 constexpr QualityScale kNoQuality{QualityKind::kNone, 0, 0};
 constexpr QualityScale kCrf51{QualityKind::kCrf, 0, 51};
@@ -66,6 +68,7 @@ constexpr std::array kPictureCodecs{
     PictureCodec{kFfv1,  AV_CODEC_ID_FFV1,       "ffv1",       kPlanar,     true,  false, 1.0, kNoQuality, kOneSpeed, kFfv1Options},
     PictureCodec{kMpeg2, AV_CODEC_ID_MPEG2VIDEO, "mpeg2video", kPlanar,     false, false, 0.0, kQuantiser, kOneSpeed, ""},
     PictureCodec{kFlv1,  AV_CODEC_ID_FLV1,       "flv",        kPlanar,     false, false, 0.0, kQuantiser, kOneSpeed, ""},
+    PictureCodec{kGif,   AV_CODEC_ID_GIF,        "gif",        kPalette,    false, false, 0.0, kNoQuality, kOneSpeed, ""},
 };
 
 // The limits of AAC are the format's (6144 bits for a frame of 1024 samples), those of the others their encoders'.
@@ -111,6 +114,7 @@ constexpr std::array kContainers{
               {kH264, kHevc, kXvid, kMpeg2}, {kAac, kMp3, kAc3, kOpus, kMp2}},
     Container{FourCC("MPG "), "MPEG program stream", "mpg,mpeg,vob", "vob", kStreamed, nullptr,
               0, nullptr, false, {kMpeg2}, {kMp2, kAc3}},
+    Container{kGif, "GIF (animated)", "gif", "gif", kStreamed, nullptr, 0, nullptr, false, {kGif}, {}},
     Container{FourCC("M4A "), "MPEG-4 audio", "m4a,m4b", "ipod", kFragmented, nullptr,
               kTags | kChapters | kCover | kTracks, nullptr, false, {}, {kAac, kAc3, kAlac}},
     Container{FourCC("MP3 "), "MP3", "mp3", "mp3", kStreamed, nullptr,

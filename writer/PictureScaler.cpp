@@ -131,10 +131,11 @@ av::Frame PictureScaler::Convert(av::Frame picture) {
     av_frame_copy_props(frame.get(), picture.get());
     PaintBlack(*frame, fit_, output_.fullRange);
     const bool deep = output_.format == AV_PIX_FMT_YUV420P10;
-    const int sampleBytes = deep ? 2 : 1;
+    const bool packed = frame->data[1] == nullptr;
+    const int sampleBytes = packed ? 4 : deep ? 2 : 1;
     uint8_t* planes[4] = {frame->data[0] + static_cast<ptrdiff_t>(fit_.top) * frame->linesize[0] +
                           fit_.left * sampleBytes};
-    for (int plane = 1; plane < 3; ++plane)
+    for (int plane = 1; plane < 3 && !packed; ++plane)
         planes[plane] = frame->data[plane] + static_cast<ptrdiff_t>(fit_.top / 2) * frame->linesize[plane] +
                         fit_.left / 2 * sampleBytes;
     if (sws_scale(scaler_.get(), picture->data, picture->linesize, 0, picture->height, planes,
@@ -159,7 +160,7 @@ void PictureScaler::PrepareFor(const AVFrame& picture) {
     if (!scaler_)
         throw WriterFailure(kWriterErrorEncode, "Pictures of " + std::to_string(picture.width) + "x" +
                                                     std::to_string(picture.height) + " cannot be scaled.");
-    const int* matrix = sws_getCoefficients(SWS_CS_DEFAULT);
+    const int* matrix = sws_getCoefficients(output_.matrix);
     sws_setColorspaceDetails(scaler_.get(), matrix, sourceFullRange_ ? 1 : 0, matrix,
                              output_.fullRange ? 1 : 0, 0, 1 << 16, 1 << 16);
 }

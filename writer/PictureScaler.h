@@ -58,6 +58,7 @@ public:
         int padHeight;
         AVPixelFormat format;
         bool fullRange;
+        int matrix = SWS_CS_DEFAULT; ///< Of FFmpeg's SWS_CS_..., where the format is RGB.
     };
 
     PictureScaler(const Output& output, AVRational sampleAspect, bool stretch, bool sourceFullRange);

@@ -77,6 +77,8 @@ void PictureStage::Show(av::Frame picture, const PicturePacer::Showing& showing)
     if (showing.count == 0)
         return;
     picture = scaler_.Convert(std::move(picture));
+    if (plan_.toPalette)
+        picture = palette_.Convert(std::move(picture));
     for (int64_t i = 0; i < showing.count; ++i)
         encoder_.Encode(*picture, showing.tick + i * plan_.clock.ticksPerPicture, take_);
 }

@@ -4,6 +4,7 @@
 
 #include "media/MediaRecords.h"
 #include "writer/FilePlan.h"
+#include "writer/PaletteMaker.h"
 #include "writer/PictureEncoder.h"
 #include "writer/PicturePacer.h"
 #include "writer/PictureScaler.h"
@@ -46,7 +47,8 @@ private:
     PictureEncoder encoder_;
     PicturePacer pacer_;
     PictureScaler scaler_;
-    FramePool pool_; ///< Used by Push only.
+    PaletteMaker palette_; ///< Where the plan wants one.
+    FramePool pool_;       ///< Used by Push only.
     PacketTaker take_;
     Shown shown_;
     StageThread<av::Frame> thread_;

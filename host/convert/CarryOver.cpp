@@ -154,7 +154,7 @@ std::string ReasonFor(const Movie& movie, const StreamInfo& stream, const FileFo
             return {};
         return "one stream of pictures is converted";
     case StreamKind::kSound:
-        if (!movie.Info().sound || movie.Info().sound->index == stream.index)
+        if (format.bHasAudio != 0 && (!movie.Info().sound || movie.Info().sound->index == stream.index))
             return {};
         return WhySoundStays(movie.Info(), stream, format);
     case StreamKind::kSubtitles:

@@ -56,6 +56,17 @@ std::optional<Size> FitWithin(const PictureStreamInfo& source, const Size& bound
                 std::min(even(source.height * factor), bounds.height)};
 }
 
+constexpr uint32_t kGif = FourCC("GIF ");
+
+/// What a GIF takes by default, which holds every picture almost whole: a small one, and few of them.
+Size GifSize() {
+    return {480, 480};
+}
+double GifRate(double rate) {
+    constexpr double kMost = 15;
+    return rate / std::ceil(rate / kMost - 0.01); // every second, every third: what is left moves evenly
+}
+
 std::optional<double> PreferredQuality(const Preferences& preferences, uint32_t codec, int height) {
     for (const uint32_t key : {codec, uint32_t{0}}) // one of no codec is for all
         if (const auto found = preferences.quality.find(key); found != preferences.quality.end())
@@ -138,11 +149,16 @@ PicturePlan PlanPictures(const Request& request, const FileFormatInfo& format,
     plan.size = request.size;
     if (!plan.size && preferences.fitWithin)
         plan.size = FitWithin(source, *preferences.fitWithin);
+    const bool isGif = CodecOf(plan.codec, format) == kGif;
+    if (!plan.size && isGif)
+        plan.size = FitWithin(source, GifSize());
     plan.frameRate = request.frameRate ? request.frameRate : preferences.frameRate;
     constexpr double kSameRate = 1.001;
     if (!plan.frameRate && preferences.maxFrameRate &&
         source.frameRate > *preferences.maxFrameRate * kSameRate)
         plan.frameRate = preferences.maxFrameRate;
+    if (!plan.frameRate && isGif && source.frameRate > 0)
+        plan.frameRate = GifRate(source.frameRate);
     plan.speed = request.speed ? request.speed : preferences.speed;
     plan.profile = preferences.profile;
     PlanDepth(plan, request, format, source);

@@ -93,8 +93,8 @@ Request FitIntoSize(Request request, const SourceInfo& source) {
     const double length = std::max(LengthToConvert(request, source), 0.001);
     const bool pictures = source.pictures && format.bHasVideo != 0;
     const bool sound = source.sound && format.bHasAudio != 0;
-    if (pictures && IsAmong(ChooseVideoCodec(request, format).value_or(0), {FourCC("FFV1")}))
-        throw Failure(Category::kRequest, "a codec without loss cannot keep below a size");
+    if (pictures && IsAmong(ChooseVideoCodec(request, format).value_or(0), {FourCC("FFV1"), FourCC("GIF ")}))
+        throw Failure(Category::kRequest, "a codec without a bit rate cannot keep below a size");
     const bool packets = IsAmong(format.fccFormat, {FourCC("TS  "), FourCC("MPG ")});
     const auto tracks = static_cast<double>(1 + FurtherSound(source, format).size());
     const double packetRate = (pictures ? source.pictures->peakRate : 0) +

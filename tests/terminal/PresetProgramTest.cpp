@@ -82,6 +82,34 @@ const Expected kPresets[] = {{"standard", "o.mp4", "h264", "aac", 0.9},
                              {"classic", "o.mp4", "mpeg4", "aac", 0.8}};
 INSTANTIATE_TEST_SUITE_P(All, ProgramPreset, testing::ValuesIn(kPresets));
 
+TEST(ProgramGif, IsSmallEvenAndHasTheColoursOfThePictures) {
+    const Folder folder;
+    const struct {
+        Args options;
+        int width;
+        int pictures;
+    } cases[] = {{{}, 480, 25}, {{"--size", "640x360", "--frame-rate", "20"}, 640, 40}};
+    for (const auto& test : cases) {
+        const std::string output = folder / "o.gif";
+        const Result result =
+            Call(Join(Args{"--preset", "standard", "-y"}, test.options, Args{Grainy("640x360"), output}));
+        ASSERT_EQ(result.code, 0) << result.err;
+        EXPECT_NE((result.out + result.err).find("not carried: sound"), std::string::npos) << result.err;
+        movieconv::Movie movie(output, {});
+        EXPECT_EQ(movie.Info().pictures->codec, "gif");
+        EXPECT_EQ(movie.Info().pictures->width, test.width);
+        EXPECT_EQ(static_cast<int>(TakeAll(movie).pictures.size()), test.pictures);
+        EXPECT_NEAR(movie.Info().duration, 2, 0.06);
+        const std::string same = Make("grainy-gif-" + std::to_string(test.width) + ".mkv",
+                                      {"-i", Grainy("640x360"), "-vf",
+                                       "fps=" + std::string(test.width == 480 ? "25/2" : "20") +
+                                           ":round=near,scale=" + std::to_string(test.width) + ":-2",
+                                       "-an", "-c:v", "ffv1"});
+        EXPECT_GE(Ssim(output, same), 0.8);
+    }
+    EXPECT_EQ(Call({"-y", "--preset", "standard", "--max-size", "1M", Grainy(), folder / "o.gif"}).code, 2);
+}
+
 TEST(ProgramPresets, AreTheStandardAndGiveWayToOptions) {
     const Folder folder;
     const struct {

@@ -103,6 +103,7 @@ protected:
         movie_.param.fccVideo = format.fccVideoCodecs[0];
         movie_.param.fccAudio = format.fccAudioCodecs[0];
         movie_.hasVideo = format.bHasVideo != 0;
+        movie_.hasAudio = format.bHasAudio != 0;
     }
 
     const Folder folder_;
