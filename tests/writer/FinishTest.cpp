@@ -301,7 +301,8 @@ TEST_P(Finish, ReachesBeyondFourGigabytes) {
                  stream.avg_frame_rate,
                  {1, 1},
                  0,
-                 &writer::FindCarriage(container, stream.index == 0 ? FourCC("XVID") : GetParam().sound)},
+                 &writer::FindCarriage(container, stream.index == 0 ? FourCC("XVID") : GetParam().sound),
+                 nullptr},
                 0);
         });
         log.ForEach([&](const writer::PlacedPacket& packet) {
