@@ -11,16 +11,6 @@ namespace {
 /// A length that is not known: the shortest that does not count as an empty source.
 constexpr double kUnknownDuration = 0.001;
 
-/// What MCGetResult and the log are told of a source's error.
-void TellError(ResultBook* results, const char* source, const char* what, int code, int64_t count) {
-    char text[MC_TEXT_SIZE];
-    std::snprintf(text, sizeof text, "The %s source %s (%d) after %lld of its records.", source, what, code,
-                  static_cast<long long>(count));
-    if (results)
-        results->Fail(MC_RESULT_SOURCE, text);
-    LogAt(kLogError, L"MovieConv::%s\r\n", text);
-}
-
 int32_t ChromaWidth(int32_t width) {
     return width / 2 + width % 2;
 }
@@ -37,6 +27,15 @@ void TellUnusable(const wchar_t* source) {
 
 } // namespace
 
+void TellSourceError(ResultBook* results, const char* source, const char* what, int code, int64_t count) {
+    char text[MC_TEXT_SIZE];
+    std::snprintf(text, sizeof text, "The %s source %s (%d) after %lld of its records.", source, what, code,
+                  static_cast<long long>(count));
+    if (results)
+        results->Fail(MC_RESULT_SOURCE, text);
+    LogAt(kLogError, L"MovieConv::%s\r\n", text);
+}
+
 std::unique_ptr<SourceVideo> SourceVideo::Make(const MCVideoSource* table) {
     if (table->nSize >= sizeof *table && table->pfnGetFormat && table->pfnGetPicture) {
         std::unique_ptr<SourceVideo> made(new SourceVideo(*table));
@@ -50,16 +49,6 @@ std::unique_ptr<SourceVideo> SourceVideo::Make(const MCVideoSource* table) {
     }
     TellUnusable(L"picture");
     return nullptr;
-}
-
-SourceVideo::~SourceVideo() {
-    if (results && source.pfnRelease)
-        source.pfnRelease(source.pUser);
-}
-
-void SourceVideo::Fail(const char* what, int code) {
-    ended = true;
-    TellError(results, "picture", what, code, count);
 }
 
 // Reads the next picture.
@@ -79,7 +68,7 @@ bool SourceVideo::Load() {
         return false;
     const int result = source.pfnGetPicture(source.pUser, &image);
     if (result < 0)
-        Fail("reported an error", result);
+        Fail("picture", "reported an error", result);
     ended = result <= 0;
     if (ended)
         return false;
@@ -97,7 +86,7 @@ double SourceVideo::Seek(double seconds, int /*mode*/) {
         while (Load() && image.llTime < Ticks(seconds)) {
         }
     } else if (const int result = source.pfnSeek(source.pUser, seconds); result == 0) {
-        Fail("cannot be sought in", result);
+        Fail("picture", "cannot be sought in", result);
     } else {
         number = Truncate<int64_t>(std::round(seconds * info.format.dFrameRate));
     }
@@ -130,16 +119,6 @@ std::unique_ptr<SourceAudio> SourceAudio::Make(const MCAudioSource* table) {
     return nullptr;
 }
 
-SourceAudio::~SourceAudio() {
-    if (results && source.pfnRelease)
-        source.pfnRelease(source.pUser);
-}
-
-void SourceAudio::Fail(const char* what, int code) {
-    ended = true;
-    TellError(results, "sound", what, code, count);
-}
-
 // Reads the next block.
 bool SourceAudio::Load() {
     const AudioFormat& format = info.format;
@@ -153,7 +132,7 @@ bool SourceAudio::Load() {
         return false;
     const int result = source.pfnGetBlock(source.pUser, &block);
     if (result < 0)
-        Fail("reported an error", result);
+        Fail("sound", "reported an error", result);
     ended = result <= 0 || block.nLength <= 0;
     if (ended)
         return false;
@@ -174,7 +153,7 @@ double SourceAudio::Seek(double to) {
         while (!waits && Load())
             waits = seconds > to || to <= 0.0;
     } else if (const int result = source.pfnSeek(source.pUser, to); result == 0) {
-        Fail("cannot be sought in", result);
+        Fail("sound", "cannot be sought in", result);
     } else {
         seconds = to;
     }
