@@ -1,6 +1,7 @@
 // Splitting the output into clips, and their names.
 #include "engine/ConvThread.h"
 #include "log/dyLog.h"
+#include "text/FileNames.h"
 #include "thread/SingleLock.h"
 
 #include <algorithm>
@@ -9,17 +10,16 @@
 
 namespace {
 
-constexpr size_t kExtensionSize = 20; // characters, the dot and the terminator included
-
-/// Puts "_", the number and the extension in place of `file`'s extension, which begins at the last dot of the
-/// whole name. False when the file name, its extension or the clip name is too long: a cut name would be
-/// another clip's.
+/// False when the file name, its extension or the clip name is too long: a cut name would be another clip's.
 bool FormatClipName(wchar_t* name, const std::wstring& file, size_t number) {
-    const size_t baseLength = std::min(file.rfind(L'.'), file.size());
-    if (file.size() >= kClipNameSize || file.size() - baseLength >= kExtensionSize)
+    const std::wstring_view whole(file);
+    if (file.size() >= kClipNameSize || text::SplitName(whole).second.size() > text::kLongestClipExtension)
         return false;
-    return swprintf(name, kClipNameSize, L"%.*ls_%02d%ls", static_cast<int>(baseLength), file.c_str(),
-                    static_cast<int>(number), file.c_str() + baseLength) > 0;
+    const std::wstring clip = text::ClipName(whole, number);
+    if (clip.size() >= kClipNameSize)
+        return false;
+    std::wcscpy(name, clip.c_str());
+    return true;
 }
 
 } // namespace

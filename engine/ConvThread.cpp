@@ -3,6 +3,7 @@
 #include "engine/SourceFormat.h"
 #include "log/dyLog.h"
 #include "media/FourCC.h"
+#include "media/Limits.h"
 #include "media/MediaWriter.h"
 #include "thread/SingleLock.h"
 
@@ -19,12 +20,12 @@ EncodeParam DefaultEncodeParam() {
     param.nWidth = 320;
     param.nHeight = 240;
     param.dFrameRate = 24.0;
-    param.nVideoBitrate = 512000;
+    param.nVideoBitrate = kUsualVideoBitrate;
     param.fccAudio = FourCC("AAC ");
     param.nSampleRate = 22050;
     param.nChannels = 2;
     param.nBitsPerSample = 16;
-    param.nAudioBitrate = 128000;
+    param.nAudioBitrate = kUsualAudioBitrate;
     param.fccFileFormat = FourCC("MP4 ");
     return param;
 }
@@ -53,7 +54,7 @@ void CompleteFrom(const VideoFormat& source, EncodeParam& param) {
     if (param.nHeight == 0)
         param.nHeight = source.nHeight;
     if (param.nVideoBitrate == 0)
-        param.nVideoBitrate = 512000;
+        param.nVideoBitrate = kUsualVideoBitrate;
 }
 
 void CompleteFrom(const AudioFormat& source, EncodeParam& param) {
@@ -140,7 +141,7 @@ int ConvThread::SetEncodeParam(const EncodeParam* param) {
     if (videoSource)
         LogEx(L"Halvane::Source Video Info: (%dx%d) %ffps, %f seconds.", videoSource->nWidth,
               videoSource->nHeight, videoSource->dFrameRate, videoSource->dDuration);
-    if (pVideoDecoder && completed.dFrameRate > 200.0)
+    if (pVideoDecoder && completed.dFrameRate > kHighestFrameRate)
         completed.dFrameRate = 30.0;
     if (audioSource)
         LogEx(L"Halvane::Source Audio Info: %dHz %dchannels, %dbps %dbits %esecond.",

@@ -2,6 +2,7 @@
 
 #include "api/Version.h"
 #include "text/Utf8.h"
+#include "text/WriteAll.h"
 
 #include <algorithm>
 #include <cerrno>
@@ -38,17 +39,6 @@ std::string LineOf(std::wstring_view text) {
     return text::ToUtf8(line) + '\n';
 }
 
-bool WriteAll(int file, std::string_view bytes) {
-    while (!bytes.empty()) {
-        const ssize_t written = write(file, bytes.data(), bytes.size());
-        if (written >= 0)
-            bytes.remove_prefix(static_cast<std::size_t>(written));
-        else if (errno != EINTR)
-            return false;
-    }
-    return true;
-}
-
 } // namespace
 
 int Log(const wchar_t* text) {
@@ -57,7 +47,7 @@ int Log(const wchar_t* text) {
     try {
         const std::string line = LineOf(text);
         const std::lock_guard lock(g_mutex);
-        return g_target == kDiscard || WriteAll(g_target, line) ? 1 : 0;
+        return g_target == kDiscard || text::WriteAll(g_target, line) ? 1 : 0;
     } catch (const std::exception&) { // no memory for the line
         return 0;
     }

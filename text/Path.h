@@ -14,6 +14,11 @@ inline std::string FolderOf(const std::string& path) {
     return slash == 0 ? "/" : path.substr(0, slash);
 }
 
+/// The name in a path, without its folder.
+inline std::string NameOf(const std::string& path) {
+    return path.substr(path.rfind('/') + 1);
+}
+
 } // namespace text
 
 #endif

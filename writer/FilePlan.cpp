@@ -1,5 +1,6 @@
 #include "writer/FilePlan.h"
 
+#include "media/Limits.h"
 #include "media/MediaRecords.h"
 #include "writer/PaletteMaker.h"
 #include "writer/WriterFailure.h"
@@ -17,8 +18,6 @@ extern "C" {
 namespace writer {
 namespace {
 
-constexpr int kDefaultVideoBitrate = 512'000;
-constexpr int kDefaultAudioBitrate = 128'000;
 constexpr double kDefaultFrameRate = 25.0;
 constexpr double kLeastFrameRate = 0.0001; // what is below is no rate, as in the engine
 constexpr double kMostFrameRate = 1000.0;
@@ -100,7 +99,7 @@ PictureSettings MakePictureSettings(const EncodeParam& param, const VideoFormat&
                                                       " cannot be written; choose another size.");
     settings.rate = ExactRate(
         FirstPositive(UsableRate(param.dFrameRate), UsableRate(source.dFrameRate), kDefaultFrameRate));
-    settings.bitrate = FirstPositive(param.nVideoBitrate, kDefaultVideoBitrate, 0);
+    settings.bitrate = FirstPositive(param.nVideoBitrate, kUsualVideoBitrate, 0);
     settings.maxBitrate = param.nVideoRateMode != 0 ? std::max(0, param.nVideoMaxBitrate) : 0;
     settings.threads = ChooseThreads(codec, options);
     SetCompression(settings, codec, options);
@@ -178,7 +177,7 @@ SoundPlan MakeSoundPlan(const EncodeParam& param, const AudioFormat& source, con
     plan.settings.sampleRate = FirstPositive(param.nSampleRate, source.nSampleRate, 0);
     plan.settings.channels = FirstPositive(param.nChannels, source.nChannels, 0);
     plan.settings.bitsPerSample = FirstPositive(param.nBitsPerSample, source.nBitsPerSample, 16);
-    plan.settings.bitrate = FirstPositive(param.nAudioBitrate, kDefaultAudioBitrate, 0);
+    plan.settings.bitrate = FirstPositive(param.nAudioBitrate, kUsualAudioBitrate, 0);
     plan.settings.maxBitrate = param.nAudioRateMode != 0 ? std::max(0, param.nAudioMaxBitrate) : 0;
     const Carriage& carriage = FindCarriage(container, plan.codec->code);
     plan.settings.sampleRates = carriage.sampleRates;

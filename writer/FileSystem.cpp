@@ -1,5 +1,7 @@
 #include "writer/FileSystem.h"
 
+#include "text/FileNames.h"
+
 #include <algorithm>
 #include <array>
 #include <cerrno>
@@ -155,15 +157,14 @@ std::string ResolveTarget(const std::string& path) {
     return real ? std::string(real.get()) : path;
 }
 
-std::unique_ptr<ByteFile> CreateBeside(FileSystem& files, const std::string& target,
-                                       const std::string& suffix, std::string& path, int& error) {
-    constexpr int kMostNumbers = 1000;
+std::unique_ptr<ByteFile> CreateBeside(FileSystem& files, const std::string& target, std::string& path,
+                                       int& error) {
     const size_t nameAt = target.rfind('/') == std::string::npos ? 0 : target.rfind('/') + 1;
     const long told = pathconf(nameAt == 0 ? "." : target.substr(0, nameAt).c_str(), _PC_NAME_MAX);
     // Some file systems count characters and tell the most bytes that those may have.
     const size_t longest = told > 0 ? std::min<size_t>(static_cast<size_t>(told), NAME_MAX) : NAME_MAX;
-    for (int number = 1; number <= kMostNumbers; ++number) {
-        const std::string tail = number == 1 ? suffix : suffix + std::to_string(number);
+    for (int number = 1; number <= text::kMostPartials; ++number) {
+        const std::string tail = text::PartialSuffix(number);
         path = target.substr(0, nameAt) + CutName(target.substr(nameAt), longest - tail.size()) + tail;
         std::unique_ptr<ByteFile> file = files.Create(path, target, error);
         if (file || error != EEXIST)

@@ -60,11 +60,10 @@ int CheckTarget(const std::string& path);
 /// Where the data of `path` really goes: links are followed, so that they stay links. Throws std::bad_alloc.
 std::string ResolveTarget(const std::string& path);
 
-/// Creates a file beside `target`, which it is to replace: its name is that of the target with `suffix`, a
-/// number when that is taken, and cut where a name would be longer than file systems allow. Null with `error`
-/// set on failure.
-std::unique_ptr<ByteFile> CreateBeside(FileSystem& files, const std::string& target,
-                                       const std::string& suffix, std::string& path, int& error);
+/// Creates a file beside `target`, which it is to replace: its name is that of the target with PartialSuffix,
+/// cut where a name would be longer than file systems allow. Null with `error` set on failure.
+std::unique_ptr<ByteFile> CreateBeside(FileSystem& files, const std::string& target, std::string& path,
+                                       int& error);
 
 } // namespace writer
 

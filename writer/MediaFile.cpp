@@ -1,5 +1,6 @@
 #include "writer/MediaFile.h"
 
+#include "media/Limits.h"
 #include "media/MediaRecords.h"
 #include "writer/FileFinisher.h"
 
@@ -22,7 +23,7 @@ bool Usable(const VideoImage& image) {
         return false;
     const int sampleBytes = format == kPictureFormatPlanar420Deep ? 2 : 1;
     return image.pY != nullptr && image.pU != nullptr && image.pV != nullptr && image.nWidth > 0 &&
-           image.nHeight > 0 && image.nWidth <= 32768 && image.nHeight <= 32768 &&
+           image.nHeight > 0 && image.nWidth <= kLargestSide && image.nHeight <= kLargestSide &&
            std::abs(image.nPitchY) >= image.nWidth * sampleBytes &&
            std::abs(image.nPitchU) >= (image.nWidth + 1) / 2 * sampleBytes &&
            std::abs(image.nPitchV) >= (image.nWidth + 1) / 2 * sampleBytes;

@@ -27,7 +27,7 @@ PartFile::PartFile(const std::string& target, const FilePlan& plan, std::shared_
                    FileSystem& files)
     : fragmented_(plan.Fragmented()), record_(std::move(record)), files_(files) {
     int error = 0;
-    std::unique_ptr<ByteFile> file = CreateBeside(files_, target, ".part", path_, error);
+    std::unique_ptr<ByteFile> file = CreateBeside(files_, target, path_, error);
     if (!file)
         throw SystemFailure(kWriterErrorOpen, error, "No file can be created in the folder \"%s\"",
                             text::FolderOf(target).c_str());

@@ -127,23 +127,6 @@ bool CarryFile(const Movie& movie, const StreamInfo& stream, uint32_t set) {
     return MWAddAttachment(set, stream.fileName.c_str(), stream.mimeType.c_str(), data.data(), size) != 0;
 }
 
-std::string_view KindName(StreamKind kind) {
-    switch (kind) {
-    case StreamKind::kPictures:
-        return "pictures";
-    case StreamKind::kSound:
-        return "sound";
-    case StreamKind::kSubtitles:
-        return "subtitles";
-    case StreamKind::kCover:
-        return "cover";
-    case StreamKind::kAttachment:
-        return "attachment";
-    default:
-        return "data";
-    }
-}
-
 /// Empty when the stream was carried, or is of a kind of which the source itself tells.
 std::string ReasonFor(const Movie& movie, const StreamInfo& stream, const FileFormatInfo& format,
                       uint32_t set, bool& hasCover) {

@@ -3,6 +3,7 @@
 #include "host/convert/CodecPlan.h"
 #include "host/convert/Failure.h"
 #include "host/convert/Formats.h"
+#include "media/Limits.h"
 #include "writer/WriterStatus.h"
 
 #include <algorithm>
@@ -10,8 +11,6 @@
 
 namespace movieconv {
 namespace {
-
-constexpr double kHighestFrameRate = 200; // of the output: from a source of more the engine makes 30
 
 /// The engine's usual codec if the format carries it, or the format's first.
 template <std::size_t N>

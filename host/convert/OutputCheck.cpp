@@ -2,11 +2,13 @@
 
 #include "api/MovieConv.h"
 #include "host/convert/Failure.h"
+#include "text/FileNames.h"
 #include "text/Path.h"
 #include "text/Utf8.h"
 
 #include <algorithm>
 #include <cerrno>
+#include <charconv>
 #include <cmath>
 #include <cstring>
 #include <dirent.h>
@@ -15,17 +17,11 @@
 #include <string_view>
 #include <sys/stat.h>
 #include <unistd.h>
-#include <utility>
 
 namespace movieconv {
 namespace {
 
-constexpr std::size_t kLongestClipExtension = 19; // the engine's limit, in characters
-constexpr std::size_t kClipNumberRoom = 12;       // "_" and the number
-
-std::string NameOf(const std::string& path) {
-    return path.substr(path.rfind('/') + 1);
-}
+constexpr std::size_t kClipNumberRoom = 12; // "_" and the number
 
 bool SameFile(const struct stat& a, const struct stat& b) {
     return a.st_dev == b.st_dev && a.st_ino == b.st_ino;
@@ -72,47 +68,41 @@ void CheckFolder(const std::string& folder) {
     }
 }
 
-/// The name up to its last dot, and the rest.
-std::pair<std::string_view, std::string_view> SplitName(std::string_view name) {
-    const std::size_t dot = std::min(name.rfind('.'), name.size());
-    return {name.substr(0, dot), name.substr(dot)};
+/// Whether `name` is that of one of the clips of `output`.
+bool IsClipName(std::string_view name, std::string_view output) {
+    const auto [base, extension] = text::SplitName(output);
+    std::size_t number = 0;
+    const char* digits = name.data() + std::min(base.size() + 1, name.size());
+    return std::from_chars(digits, name.data() + name.size(), number).ec == std::errc() &&
+           name == text::ClipName(output, number);
 }
 
-/// Whether `name` is a clip name made of `base` and `extension`: base_00.ext and so on.
-bool IsClipName(std::string_view name, std::string_view base, std::string_view extension) {
-    const std::size_t frame = base.size() + 1 + extension.size();
-    if (name.size() < frame + 2 || name.substr(0, base.size()) != base || name[base.size()] != '_' ||
-        name.substr(name.size() - extension.size()) != extension)
-        return false;
-    const std::string_view number = name.substr(base.size() + 1, name.size() - frame);
-    return std::all_of(number.begin(), number.end(), [](char c) { return c >= '0' && c <= '9'; });
-}
-
-/// The last clip's number as the engine writes it; of a source of unknown length as if it lasted a day.
-std::string LastClipNumber(const Request& request) {
+/// The last clip's number; of a source of unknown length as if it lasted a day.
+std::size_t LastClip(const Request& request) {
     constexpr double kDay = 86400;
-    return fmt::format("{:02}", std::llround(request.length.value_or(kDay) / *request.split));
+    return static_cast<std::size_t>(std::llround(request.length.value_or(kDay) / *request.split));
 }
 
 void CheckClips(const Request& request, const struct stat* input) {
-    const std::string name = NameOf(request.output);
-    const auto [base, extension] = SplitName(name);
+    const std::string name = text::NameOf(request.output);
+    const auto [base, extension] = text::SplitName(std::string_view(name));
     if (base.empty() || extension.empty()) {
         throw Failure(
             Category::kRequest,
             fmt::format("the name of a split output needs an extension, as in \"{}.mp4\"", request.output));
     }
     const std::size_t pathCharacters = text::FromUtf8(request.output).size();
-    if (pathCharacters + kClipNumberRoom > MC_MAX_TARGET_NAME || extension.size() > kLongestClipExtension) {
+    if (pathCharacters + kClipNumberRoom > MC_MAX_TARGET_NAME ||
+        extension.size() > text::kLongestClipExtension) {
         throw Failure(
             Category::kRequest,
             fmt::format("the name \"{}\" is too long to number clips; choose a shorter one", request.output));
     }
     const std::string folder = text::FolderOf(request.output);
-    CheckName(fmt::format("{}/{}_{}{}", folder, base, LastClipNumber(request), extension));
+    CheckName(folder + "/" + text::ClipName(std::string_view(name), LastClip(request)));
     const std::unique_ptr<DIR, int (*)(DIR*)> listing(opendir(folder.c_str()), closedir);
     while (const dirent* entry = listing ? readdir(listing.get()) : nullptr)
-        if (IsClipName(entry->d_name, base, extension))
+        if (IsClipName(entry->d_name, name))
             CheckTarget(folder + "/" + entry->d_name, input, request);
 }
 
@@ -129,13 +119,11 @@ bool IsOutput(const std::string& path, const Request& request) {
         return true;
     if (!AreSame(text::FolderOf(path), text::FolderOf(request.output)))
         return false;
-    std::string name = NameOf(path);
-    constexpr std::string_view kSuffix = ".part";
-    if (name.size() > kSuffix.size() && name.ends_with(kSuffix))
-        name.resize(name.size() - kSuffix.size());
-    const std::string output = NameOf(request.output);
-    const auto [base, extension] = SplitName(output);
-    return name == output || (request.split && IsClipName(name, base, extension));
+    std::string name = text::NameOf(path);
+    if (name.size() > text::kPartialSuffix.size() && name.ends_with(text::kPartialSuffix))
+        name.resize(name.size() - text::kPartialSuffix.size());
+    const std::string output = text::NameOf(request.output);
+    return name == output || (request.split && IsClipName(name, output));
 }
 
 void CheckName(const std::string& path, const std::string& suffix) {
@@ -143,7 +131,7 @@ void CheckName(const std::string& path, const std::string& suffix) {
     const long most = pathconf(text::FolderOf(path).c_str(), _PC_NAME_MAX); // -1: no limit is known
     struct stat status {};
     const bool refused = lstat(whole.c_str(), &status) != 0 && errno == ENAMETOOLONG;
-    const std::string name = NameOf(whole);
+    const std::string name = text::NameOf(whole);
     if (refused || (most >= 0 && name.size() > static_cast<std::size_t>(most))) {
         throw Failure(
             Category::kOutput,

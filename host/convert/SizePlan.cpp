@@ -6,6 +6,7 @@
 #include "host/convert/EncodePlan.h"
 #include "host/convert/Failure.h"
 #include "media/FourCC.h"
+#include "media/Limits.h"
 
 #include <algorithm>
 #include <cmath>
@@ -20,7 +21,6 @@ constexpr double kSoundSpread = 1.15;
 constexpr double kBufferSeconds = 2;    // of pictures, ahead of their rate
 constexpr double kLeastSoundBits = 0.5; // a sample and channel, below which the encoders do not go
 constexpr double kMostSoundShare = 0.25;
-constexpr double kUsualSoundRate = 128'000;
 constexpr double kLeastPictureRate = 4000;
 
 // What a container adds.
@@ -55,7 +55,7 @@ double FitSound(Request& request, const FileFormatInfo& format, const SoundStrea
     }
     const double floor = least * plan.channels.value_or(source.channels);
     const double rate =
-        std::max(floor, std::min(share, static_cast<double>(plan.rate.value_or(kUsualSoundRate))));
+        std::max(floor, std::min(share, static_cast<double>(plan.rate.value_or(kUsualAudioBitrate))));
     request.audioRate = static_cast<int32_t>(rate);
     return rate * kSoundSpread;
 }

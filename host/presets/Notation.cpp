@@ -1,5 +1,7 @@
 #include "host/presets/Notation.h"
 
+#include "media/Limits.h"
+
 #include <algorithm>
 #include <charconv>
 #include <cmath>
@@ -83,8 +85,7 @@ std::optional<Size> ParseSize(std::string_view text) {
     const double width = *ParseNumber(text.substr(0, cross));
     const double height = *ParseNumber(text.substr(cross + 1));
     constexpr double kLeast = 2;
-    constexpr double kMost = 32768;
-    if (std::min(width, height) < kLeast || std::max(width, height) > kMost)
+    if (std::min(width, height) < kLeast || std::max(width, height) > kLargestSide)
         return std::nullopt;
     return Size{static_cast<int32_t>(width), static_cast<int32_t>(height)};
 }
@@ -111,8 +112,7 @@ std::optional<double> ParseFrameRate(std::string_view text) {
     const auto number = ParseNumber(text.substr(0, slash));
     const auto divisor =
         slash == std::string_view::npos ? std::optional(1.0) : ParseNumber(text.substr(slash + 1));
-    constexpr double kMost = 200;
-    if (!number || !divisor || *divisor <= 0 || *number <= 0 || *number / *divisor > kMost)
+    if (!number || !divisor || *divisor <= 0 || *number <= 0 || *number / *divisor > kHighestFrameRate)
         return std::nullopt;
     return *number / *divisor;
 }

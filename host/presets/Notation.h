@@ -20,7 +20,7 @@ std::optional<int32_t> ParseRate(std::string_view text);
 /// Bytes from "25000000", "700k", "25M" or "4.7G" (powers of 1000). Nothing for anything else, 0 included.
 std::optional<int64_t> ParseBytes(std::string_view text);
 
-/// From "640x360", both from 2 to 32768. Nothing for anything else.
+/// From "640x360", both from 2 to kLargestSide. Nothing for anything else.
 std::optional<Size> ParseSize(std::string_view text);
 
 /// Pictures per second from "25", "23.976" or "30000/1001", up to 200. Nothing for anything else.

@@ -3,6 +3,7 @@
 #include "host/presets/Notation.h"
 #include "host/presets/Preset.h"
 #include "media/FourCC.h"
+#include "media/Limits.h"
 
 #include <algorithm>
 #include <cctype>
@@ -198,7 +199,8 @@ private:
 
     void TakeVideo(const Json& value, const std::string& pointer) {
         constexpr const char* kRate = "a bit rate such as \"1.5M\"";
-        constexpr const char* kFrameRate = "a frame rate up to 200, such as 25 or \"30000/1001\"";
+        static const std::string kFrameRate =
+            fmt::format("a frame rate up to {}, such as 25 or \"30000/1001\"", kHighestFrameRate);
         Preferences& into = preferences_;
         TakeMembers(
             value, pointer,
@@ -211,8 +213,8 @@ private:
                               "faster or fastest")},
              {"profile", Taking(into.profile, Among<Profile>(kProfileNames), "baseline, main or high")},
              {"fit_within", Taking(into.fitWithin, &AsSize, "a size such as \"1280x720\"")},
-             {"frame_rate", Taking(into.frameRate, &AsFrameRate, kFrameRate)},
-             {"max_frame_rate", Taking(into.maxFrameRate, &AsFrameRate, kFrameRate)},
+             {"frame_rate", Taking(into.frameRate, &AsFrameRate, kFrameRate.c_str())},
+             {"max_frame_rate", Taking(into.maxFrameRate, &AsFrameRate, kFrameRate.c_str())},
              {"leave_out", Taking(into.noVideo, &AsFlag, "true or false")}});
     }
 

@@ -9,6 +9,7 @@
 #include <cstdint>
 #include <optional>
 #include <string>
+#include <string_view>
 #include <vector>
 
 extern "C" {
@@ -21,6 +22,9 @@ namespace movieconv {
 enum class Certainty { kKnown, kEstimated, kGuessed };
 
 enum class StreamKind { kPictures, kSound, kSubtitles, kCover, kAttachment, kData };
+
+/// What people call a stream of that kind: "pictures", "cover".
+std::string_view KindName(StreamKind kind);
 
 struct Tag {
     std::string key; ///< As FFmpeg calls it, "title"; others as the container has them.
@@ -68,10 +72,12 @@ struct PictureStreamInfo {
     Crop crop{}; ///< What is cut off; even numbers.
 };
 
+// Of PictureStreamInfo::colorTransfer.
+constexpr int kPerceptualQuantizer = 16;
+constexpr int kHybridLogGamma = 18;
+
 /// Whether the pictures are made for more light and colour than usual displays have.
 inline bool IsHdr(const PictureStreamInfo& pictures) {
-    constexpr int kPerceptualQuantizer = 16;
-    constexpr int kHybridLogGamma = 18;
     return pictures.colorTransfer == kPerceptualQuantizer || pictures.colorTransfer == kHybridLogGamma;
 }
 

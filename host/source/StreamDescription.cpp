@@ -212,6 +212,24 @@ StreamInfo DescribeStream(AVFormatContext& context, AVStream* stream, int64_t st
 
 } // namespace
 
+std::string_view KindName(StreamKind kind) {
+    switch (kind) {
+    case StreamKind::kPictures:
+        return "pictures";
+    case StreamKind::kSound:
+        return "sound";
+    case StreamKind::kSubtitles:
+        return "subtitles";
+    case StreamKind::kCover:
+        return "cover";
+    case StreamKind::kAttachment:
+        return "attachment";
+    case StreamKind::kData:
+        break;
+    }
+    return "data";
+}
+
 void TakeLight(const AVMasteringDisplayMetadata* display, const AVContentLightMetadata* light,
                PictureStreamInfo& info) {
     if (display != nullptr && display->has_primaries != 0 && display->has_luminance != 0) {

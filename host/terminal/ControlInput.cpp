@@ -1,5 +1,7 @@
 #include "host/terminal/ControlInput.h"
 
+#include "text/WriteAll.h"
+
 #include <array>
 #include <cerrno>
 #include <csignal>
@@ -51,15 +53,6 @@ Terminal& TheTerminal() {
 
 bool OwnsTerminal() {
     return isatty(STDIN_FILENO) != 0 && tcgetpgrp(STDIN_FILENO) == getpgrp();
-}
-
-void WriteAll(int descriptor, const std::string& text) {
-    for (std::size_t done = 0; done < text.size();) {
-        const ssize_t count = write(descriptor, text.data() + done, text.size() - done);
-        if (count < 0 && errno != EINTR)
-            return;
-        done += count > 0 ? static_cast<std::size_t>(count) : 0;
-    }
 }
 
 } // namespace
@@ -183,8 +176,9 @@ void ControlInput::LeaveAtOnce(int signal) {
     try {
         const std::lock_guard lock(fileMutex_);
         if (!file_.empty())
-            WriteAll(STDERR_FILENO,
-                     fmt::format("\nmovieconv: left at once; what was written so far is in \"{}\"\n", file_));
+            text::WriteAll(
+                STDERR_FILENO,
+                fmt::format("\nmovieconv: left at once; what was written so far is in \"{}\"\n", file_));
     } catch (const std::bad_alloc&) { // leaving matters more than the message
     }
     // Ends as if the signal had not been caught, which the shell shows as 128 plus its number.

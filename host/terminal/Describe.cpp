@@ -22,27 +22,7 @@ std::string DescribeLength(double seconds, Certainty certainty) {
     return FormatTime(seconds, true);
 }
 
-std::string_view KindName(StreamKind kind) {
-    switch (kind) {
-    case StreamKind::kPictures:
-        return "pictures";
-    case StreamKind::kSound:
-        return "sound";
-    case StreamKind::kSubtitles:
-        return "subtitles";
-    case StreamKind::kCover:
-        return "cover";
-    case StreamKind::kAttachment:
-        return "attachment";
-    case StreamKind::kData:
-        break;
-    }
-    return "data";
-}
-
 std::string DescribeColours(const PictureStreamInfo& pictures) {
-    constexpr int kPerceptualQuantizer = 16; // ISO/IEC 23091-2
-    constexpr int kHybridLogGamma = 18;
     std::string text = pictures.colorTransfer == kPerceptualQuantizer ? ", HDR (PQ)"
                        : pictures.colorTransfer == kHybridLogGamma    ? ", HDR (HLG)"
                                                                       : "";

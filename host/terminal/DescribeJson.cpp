@@ -40,24 +40,6 @@ Json FlagsOf(const StreamFlags& flags) {
     return list;
 }
 
-const char* NameOf(StreamKind kind) {
-    switch (kind) {
-    case StreamKind::kPictures:
-        return "pictures";
-    case StreamKind::kSound:
-        return "sound";
-    case StreamKind::kSubtitles:
-        return "subtitles";
-    case StreamKind::kCover:
-        return "cover";
-    case StreamKind::kAttachment:
-        return "attachment";
-    case StreamKind::kData:
-        break;
-    }
-    return "data";
-}
-
 const char* NameOf(Certainty certainty) {
     return certainty == Certainty::kKnown       ? "known"
            : certainty == Certainty::kEstimated ? "estimated"
@@ -94,8 +76,8 @@ void Add(Json& object, const PictureStreamInfo& pictures) {
 }
 
 Json Object(const StreamInfo& stream) {
-    Json object{{"index", stream.index},          {"kind", NameOf(stream.kind)},  {"codec", stream.codec},
-                {"profile", stream.profile},      {"language", stream.language},  {"title", stream.title},
+    Json object{{"index", stream.index},          {"kind", KindName(stream.kind)}, {"codec", stream.codec},
+                {"profile", stream.profile},      {"language", stream.language},   {"title", stream.title},
                 {"flags", FlagsOf(stream.flags)}, {"decodable", stream.decodable}};
     object["begin_s"] = stream.begin ? Json(*stream.begin) : Json(nullptr);
     object["end_s"] = Told(stream.pictures ? stream.pictures->duration

@@ -6,6 +6,7 @@
 #include "host/presets/Notation.h"
 #include "host/presets/Preset.h"
 #include "host/terminal/Help.h"
+#include "media/Limits.h"
 
 #include <CLI/CLI.hpp>
 #include <charconv>
@@ -102,10 +103,18 @@ CLI::Option* AddCrop(CLI::App& app, Options& options) {
         ->type_name("T:B:L:R");
 }
 
+CLI::Option* AddRate(CLI::App& app, const std::string& name, std::optional<int32_t>& rate,
+                     const char* example, const std::string& help) {
+    return AddParsed(app, name, ParseRate, rate, fmt::format("a bit rate up to 2147M, such as {}", example),
+                     help)
+        ->type_name("RATE");
+}
+
 void AddPictures(CLI::App& app, Options& options) {
     const std::string group = "Pictures";
     AddParsed(app, "--size", ParseSize, options.request.size,
-              "a size from 2x2 to 32768x32768, such as 640x360", "Picture size; by default the source's")
+              fmt::format("a size from 2x2 to {0}x{0}, such as 640x360", kLargestSide),
+              "Picture size; by default the source's")
         ->type_name("WxH")
         ->group(group);
     AddChoice<Fit>(app, "--fit", options.request.fit,
@@ -126,7 +135,7 @@ void AddPictures(CLI::App& app, Options& options) {
                    "Bits of a colour; by default the source's, as far as\nthe codec has them")
         ->group(group);
     AddParsed(app, "--frame-rate", ParseFrameRate, options.request.frameRate,
-              "a frame rate up to 200, such as 25 or 30000/1001",
+              fmt::format("a frame rate up to {}, such as 25 or 30000/1001", kHighestFrameRate),
               "Pictures per second; by default the source's")
         ->type_name("N")
         ->group(group);
@@ -143,14 +152,11 @@ void AddPictures(CLI::App& app, Options& options) {
                      "How long the encoder looks for a smaller file")
         ->type_name("SPEED")
         ->group(group);
-    AddParsed(app, "--video-rate", ParseRate, options.request.videoRate,
-              "a bit rate up to 2147M, such as 512k or 1.5M",
-              "Bits per second, as 1.5M, instead of a quality")
-        ->type_name("RATE")
+    AddRate(app, "--video-rate", options.request.videoRate, "512k or 1.5M",
+            "Bits per second, as 1.5M, instead of a quality")
         ->group(group);
-    AddParsed(app, "--video-max-rate", ParseRate, options.request.videoMaxRate,
-              "a bit rate up to 2147M, such as 512k or 1.5M", "Upper bit rate: the rate becomes a target")
-        ->type_name("RATE")
+    AddRate(app, "--video-max-rate", options.request.videoMaxRate, "512k or 1.5M",
+            "Upper bit rate: the rate becomes a target")
         ->group(group);
 }
 
@@ -164,13 +170,11 @@ void AddSound(CLI::App& app, Options& options) {
         ->check(CLI::Range(4000, 384000).description(""))
         ->type_name("HZ")
         ->group(group);
-    AddParsed(app, "--audio-rate", ParseRate, options.request.audioRate,
-              "a bit rate up to 2147M, such as 128k", "Bits per second, as 128k; by default the preset's")
-        ->type_name("RATE")
+    AddRate(app, "--audio-rate", options.request.audioRate, "128k",
+            "Bits per second, as 128k; by default the preset's")
         ->group(group);
-    AddParsed(app, "--audio-max-rate", ParseRate, options.request.audioMaxRate,
-              "a bit rate up to 2147M, such as 128k", "Upper bit rate: the rate becomes a target")
-        ->type_name("RATE")
+    AddRate(app, "--audio-max-rate", options.request.audioMaxRate, "128k",
+            "Upper bit rate: the rate becomes a target")
         ->group(group);
 }
 
@@ -331,7 +335,7 @@ void RequirePieces(const Options& options) {
         throw Failure(Category::kRequest, "--jobs converts many places at once and so excludes --preview");
 }
 
-void RequireNames(const Options& options) {
+void RequireSense(const Options& options) {
     if (NeedsInput(options.task) && options.request.input.empty())
         throw Failure(Category::kRequest, "INPUT is missing; try \"movieconv --help\"");
     if (NeedsOutput(options.task) && options.request.output.empty())
@@ -411,7 +415,7 @@ std::optional<Options> ParseOptions(int argc, char** argv) {
         std::fputs(CompletionScript(*options.completion, OptionEntries(app)).c_str(), stdout);
         return std::nullopt;
     }
-    RequireNames(options);
+    RequireSense(options);
     if (NeedsOutput(options.task))
         ApplyPreset(options);
     if (options.preview)

@@ -2,6 +2,7 @@
 
 #include "ffmpeg/AvHandles.h"
 #include "host/convert/Failure.h"
+#include "text/FileNames.h"
 
 extern "C" {
 #include <libavutil/crc.h>
@@ -93,10 +94,9 @@ av::Packet EncodePng(const AVFrame& frame) {
 
 /// A new file beside `path`, whose name goes to `temporary`. Null with errno set.
 std::FILE* CreateBeside(const std::string& path, std::string& temporary) {
-    constexpr int kMostNumbers = 1000;
     std::FILE* file = nullptr;
-    for (int number = 1; number <= kMostNumbers && file == nullptr; ++number) {
-        temporary = path + ".part" + (number == 1 ? "" : std::to_string(number));
+    for (int number = 1; number <= text::kMostPartials && file == nullptr; ++number) {
+        temporary = path + text::PartialSuffix(number);
         file = std::fopen(temporary.c_str(), "wbxe");
         if (file == nullptr && errno != EEXIST)
             break;

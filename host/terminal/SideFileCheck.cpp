@@ -3,6 +3,7 @@
 #include "host/convert/Failure.h"
 #include "host/convert/OutputCheck.h"
 #include "host/terminal/Preview.h"
+#include "text/FileNames.h"
 
 #include <fmt/format.h>
 
@@ -26,7 +27,7 @@ void CheckSideFiles(const Options& options) {
         CheckSideFile("--log", *options.log, options.request);
     if (options.preview) {
         CheckSideFile("--preview", *options.preview, options.request);
-        CheckName(*options.preview, ".part1000");
+        CheckName(*options.preview, text::PartialSuffix(text::kMostPartials));
         CheckPreview(*options.preview, options.request.overwrite);
     }
     if (options.log && options.preview &&

@@ -4,6 +4,7 @@
 #include "host/terminal/SideFile.h"
 #include "logsink/LogSink.h"
 #include "text/Utf8.h"
+#include "text/WriteAll.h"
 
 extern "C" {
 #include <libavutil/log.h>
@@ -93,13 +94,7 @@ int StandardStreams::Columns() const {
 }
 
 bool StandardStreams::Write(int descriptor, std::string_view text) {
-    while (!text.empty()) {
-        const ssize_t count = write(descriptor, text.data(), text.size());
-        if (count < 0 && errno != EINTR)
-            return errno == EPIPE;
-        text.remove_prefix(count > 0 ? static_cast<std::size_t>(count) : 0);
-    }
-    return true;
+    return text::WriteAll(descriptor, text) || errno == EPIPE;
 }
 
 } // namespace movieconv

@@ -1,6 +1,7 @@
 #include "host/window/model/Journal.h"
 
 #include "text/Path.h"
+#include "text/WriteAll.h"
 
 #include <QCoreApplication>
 #include <QDir>
@@ -32,25 +33,14 @@ struct Descriptor {
     int number;
 };
 
-bool WriteAll(int descriptor, const QByteArray& bytes) {
-    for (qsizetype done = 0; done < bytes.size();) {
-        const ssize_t count =
-            write(descriptor, bytes.data() + done, static_cast<size_t>(bytes.size() - done));
-        if (count < 0 && errno == EINTR)
-            continue;
-        if (count <= 0)
-            return false;
-        done += count;
-    }
-    return true;
-}
-
 /// Replaces the file so that after a power cut it is the old one or the new one. False with errno set.
 bool Replace(const std::string& path, const QByteArray& bytes) {
     const std::string temporary = path + ".new";
     {
         const Descriptor file(open(temporary.c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0600));
-        if (file.number < 0 || !WriteAll(file.number, bytes) || fsync(file.number) != 0)
+        if (file.number < 0 ||
+            !text::WriteAll(file.number, {bytes.data(), static_cast<size_t>(bytes.size())}) ||
+            fsync(file.number) != 0)
             return false;
     }
     if (std::rename(temporary.c_str(), path.c_str()) != 0)
