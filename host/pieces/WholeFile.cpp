@@ -2,6 +2,7 @@
 
 #include "host/convert/Failure.h"
 #include "text/Path.h"
+#include "text/WriteAll.h"
 
 #include <array>
 #include <cerrno>
@@ -39,18 +40,6 @@ Failure CannotWrite(const std::string& path) {
             fmt::format("cannot write \"{}\": {}", path, std::strerror(errno))};
 }
 
-bool WriteAll(int descriptor, std::string_view text) {
-    while (!text.empty()) {
-        const ssize_t count = write(descriptor, text.data(), text.size());
-        if (count < 0 && errno == EINTR)
-            continue;
-        if (count < 0)
-            return false;
-        text.remove_prefix(static_cast<std::size_t>(count));
-    }
-    return true;
-}
-
 } // namespace
 
 std::string ReadWhole(const std::string& path, int64_t most) {
@@ -82,8 +71,8 @@ std::string ReadWhole(const std::string& path, int64_t most) {
 void WriteWhole(const std::string& path, std::string_view text) {
     const std::string making = NameInTheMaking(path);
     Descriptor file(open(making.c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0666));
-    const bool written = file.Number() >= 0 && WriteAll(file.Number(), text) && fsync(file.Number()) == 0 &&
-                         file.Close() && RenameLastingly(making, path);
+    const bool written = file.Number() >= 0 && text::WriteAll(file.Number(), text) &&
+                         fsync(file.Number()) == 0 && file.Close() && RenameLastingly(making, path);
     if (written)
         return;
     const Failure failure = CannotWrite(path);
@@ -93,7 +82,8 @@ void WriteWhole(const std::string& path, std::string_view text) {
 
 void AppendWhole(const std::string& path, std::string_view text) {
     Descriptor file(open(path.c_str(), O_WRONLY | O_CREAT | O_APPEND | O_CLOEXEC, 0666));
-    if (file.Number() < 0 || !WriteAll(file.Number(), text) || fsync(file.Number()) != 0 || !file.Close())
+    if (file.Number() < 0 || !text::WriteAll(file.Number(), text) || fsync(file.Number()) != 0 ||
+        !file.Close())
         throw CannotWrite(path);
 }
 
