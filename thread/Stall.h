@@ -12,8 +12,8 @@
 constexpr std::chrono::milliseconds kStallLimit{5000};
 
 /// Waits until `ready` holds, as the condition variable itself does. `who` is the beginning of the log's
-/// lines, such as "Movie::A decoder waits for the source". They are written under the lock, which nobody needs
-/// for as long as nothing goes on.
+/// lines, such as "Movie::A decoder waits for the source". They are written under the lock, which nobody
+/// needs for as long as nothing goes on.
 template <class Ready>
 void WaitAndTell(std::condition_variable& changed, std::unique_lock<std::mutex>& lock, Ready ready,
                  const wchar_t* who, std::chrono::milliseconds limit = kStallLimit) {
