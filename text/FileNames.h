@@ -24,12 +24,14 @@ SplitName(std::basic_string_view<Char> name) {
 /// The name of clip `number`, from 0, of the output `name`: NAME_00.EXT, with as many digits as it takes.
 template <class Char>
 std::basic_string<Char> ClipName(std::basic_string_view<Char> name, std::size_t number) {
+    constexpr std::size_t kLeastDigits = 2;
     const auto [base, extension] = SplitName(name);
-    const std::string digits = std::to_string(number);
+    std::basic_string<Char> digits;
+    for (; number > 0 || digits.size() < kLeastDigits; number /= 10)
+        digits.insert(digits.begin(), static_cast<Char>('0' + number % 10));
     std::basic_string<Char> clip(base);
     clip += Char{'_'};
-    clip.append(digits.size() < 2 ? 2 - digits.size() : 0, Char{'0'});
-    clip.append(digits.begin(), digits.end());
+    clip += digits;
     return clip += extension;
 }
 

@@ -292,6 +292,7 @@ TEST_P(Finish, ReachesBeyondFourGigabytes) {
     ASSERT_EQ(room.Close(*file), 0);
     const writer::Container& container = *writer::FindContainer(GetParam().format);
     const writer::Extras extras;
+    const writer::TrackLabel label;
     const auto makeIndex = [&](int64_t place) {
         writer::Mp4Index index(container, true, extras);
         WithStreams(path_, [&](const AVStream& stream) {
@@ -302,7 +303,7 @@ TEST_P(Finish, ReachesBeyondFourGigabytes) {
                  {1, 1},
                  0,
                  &writer::FindCarriage(container, stream.index == 0 ? FourCC("XVID") : GetParam().sound),
-                 nullptr},
+                 &label},
                 0);
         });
         log.ForEach([&](const writer::PlacedPacket& packet) {
