@@ -19,6 +19,7 @@ set(public_headers
   host/convert/Request.h
   host/convert/Room.h
   host/convert/Work.h
+  host/source/Crop.h
   host/source/Deinterlace.h
   logsink/LogSink.h
   media/Decoders.h
@@ -39,6 +40,17 @@ foreach(header IN LISTS public_headers)
   set(module "(Common/Image|api|engine|host/convert|host/source|logsink|media|platform|thread|writer)")
   string(REGEX REPLACE "#include \"${module}/([A-Za-z]+\\.h)\"" "#include <movieconv/\\2>" text "${text}")
   string(REGEX REPLACE "([^A-Za-z/])${module}/([A-Za-z]+\\.h)" "\\1<movieconv/\\3>" text "${text}")
+  string(REGEX MATCHALL "#include \"[^\"]+\"" left "${text}")
+  string(REGEX MATCHALL "#include <movieconv/[A-Za-z]+\\.h>" own "${text}")
+  foreach(include IN LISTS own)
+    string(REGEX REPLACE ".*/(.*)>" "\\1" include "${include}")
+    if(NOT public_headers MATCHES "/${include}(;|$)")
+      list(APPEND left ${include})
+    endif()
+  endforeach()
+  if(left)
+    message(FATAL_ERROR "${header} includes what is not installed with it: ${left}")
+  endif()
   cmake_path(GET header FILENAME name)
   file(CONFIGURE OUTPUT ${public_header_dir}/${name} CONTENT "${text}" @ONLY)
   set_property(DIRECTORY ${PROJECT_SOURCE_DIR} APPEND PROPERTY CMAKE_CONFIGURE_DEPENDS ${header})
