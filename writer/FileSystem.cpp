@@ -52,7 +52,11 @@ public:
     }
 
     int64_t Write(const uint8_t* data, int64_t size) override {
-        return Retry([&] { return write(descriptor_, data, static_cast<size_t>(size)); });
+        const int64_t result = Retry([&] { return write(descriptor_, data, static_cast<size_t>(size)); });
+        unsent_ += std::max<int64_t>(result, 0);
+        if (unsent_ >= kMostUnsent)
+            Send();
+        return result;
     }
     int64_t Read(uint8_t* data, int64_t size) override {
         return Retry([&] { return read(descriptor_, data, static_cast<size_t>(size)); });
@@ -68,6 +72,16 @@ public:
     }
 
 private:
+    /// Gigabytes that the system has kept from the disk would make the sync at the end of a large file last.
+    static constexpr int64_t kMostUnsent = 16 << 20;
+
+    /// Makes what was written go to the disk from now on, without waiting for it. An error is the sync's to
+    /// tell.
+    void Send() {
+        unsent_ = 0;
+        sync_file_range(descriptor_, 0, 0, SYNC_FILE_RANGE_WRITE);
+    }
+
     /// Who may not give a file away still gives it the group where he is in it. What a group may do is not
     /// granted to another one.
     void Resemble(const struct stat& model) const {
@@ -80,6 +94,7 @@ private:
     }
 
     int descriptor_ = -1;
+    int64_t unsent_ = 0; // bytes written since the last Send
 };
 
 class PosixFiles final : public FileSystem {
