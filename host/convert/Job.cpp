@@ -72,7 +72,7 @@ public:
 private:
     void Run() noexcept;
     Verdict Convert();
-    std::unique_ptr<Movie> Open();
+    void SetOpening(std::shared_ptr<Interruption> opening);
 
     const Request request_;
     Outlet outlet_;
@@ -112,34 +112,30 @@ void Job::Impl::Run() noexcept {
 Verdict Job::Impl::Convert() {
     ChooseFormat(request_);
     CheckOutput(request_);
-    const std::unique_ptr<Movie> movie = Open();
-    if (movie)
-        return Course(request_, *movie, wishes_, outlet_).Run();
     Verdict stopped;
     stopped.outcome = Outcome::kStopped;
-    return stopped;
+    const auto interruption = std::make_shared<Interruption>();
+    bool open = false;
+    try {
+        SetOpening(interruption);
+        if (wishes_.stop)
+            return stopped;
+        Movie movie = OpenMovie(request_, interruption);
+        SetOpening(nullptr);
+        if (interruption->Interrupted())
+            return stopped;
+        open = true;
+        return Course(request_, movie, wishes_, outlet_).Run();
+    } catch (const Failure&) {
+        if (open || !interruption->Interrupted())
+            throw;
+        return stopped;
+    }
 }
 
-/// Null when it is stopped before the source is open.
-std::unique_ptr<Movie> Job::Impl::Open() {
-    const auto interruption = std::make_shared<Interruption>();
-    const auto setOpening = [this](std::shared_ptr<Interruption> opening) {
-        const std::lock_guard lock(mutex_);
-        opening_ = std::move(opening);
-    };
-    setOpening(interruption);
-    std::unique_ptr<Movie> movie;
-    try {
-        if (!wishes_.stop)
-            movie.reset(new Movie(OpenMovie(request_, interruption)));
-    } catch (const Failure&) {
-        setOpening(nullptr);
-        if (!interruption->Interrupted())
-            throw;
-        return nullptr;
-    }
-    setOpening(nullptr);
-    return interruption->Interrupted() ? nullptr : std::move(movie);
+void Job::Impl::SetOpening(std::shared_ptr<Interruption> opening) {
+    const std::lock_guard lock(mutex_);
+    opening_ = std::move(opening);
 }
 
 Job::Job(Request request, Observer& observer, Loop loop)
