@@ -5,6 +5,8 @@
 #include "host/window/widgets/QueueView.h"
 #include "host/window/widgets/RangeStrip.h"
 #include "host/window/widgets/WorkPage.h"
+#include "tests/support/Process.h"
+#include "tests/support/SmallDisk.h"
 #include "tests/support/TestMovies.h"
 #include "tests/window/ScriptedRunner.h"
 
@@ -13,6 +15,7 @@
 #include <QAction>
 #include <QApplication>
 
+#include <csignal>
 #include <set>
 
 using namespace movieconv::window;
@@ -174,4 +177,75 @@ TEST_F(PicturesTest, KeepsWhatTheDecoderSaysInTheLogOfTheMovie) {
     EXPECT_FALSE(At(0).notes.filter(QStringLiteral(" @ 0x")).isEmpty())
         << "no line of a decoder's in\n"
         << At(0).notes.join(QLatin1Char('\n')).toStdString();
+}
+
+namespace {
+
+constexpr char kKilled[] = "MOVIECONV_TEST_KILLED"; // the folder, for the process that is to be killed
+
+/// Converts a movie in a window over the journal in `folder`, with a word on the output when it is under way.
+void ConvertUntilKilled(const std::string& folder) {
+    ConvertRunner runner;
+    Settings settings(QString::fromStdString(folder + "/settings"));
+    App app(runner, settings, folder + "/queue");
+    app.TheQueue().SetNaming({QStringLiteral("{name} new"), folder});
+    app.Begin({folder + "/movie.mkv"});
+    const auto& entries = app.TheQueue().Entries();
+    ASSERT_TRUE(Await([&] { return entries.size() == 1 && entries[0].IsStartable(); }));
+    app.TheDispatcher().Start();
+    ASSERT_TRUE(Await([&] {
+        return entries[0].figures.position > 0 &&
+               ReadFile(folder + "/queue").find("active") != std::string::npos;
+    }));
+    app.TheDispatcher().PauseAll();
+    WriteFile(folder + "/under way", "");
+    Await([] { return false; });
+}
+
+} // namespace
+
+TEST_F(PicturesTest, ComesBackAfterAKill) {
+    if (const char* killed = std::getenv(kKilled))
+        return ConvertUntilKilled(killed);
+    std::filesystem::copy_file(Holiday(), folder / "movie.mkv");
+    setenv(kKilled, folder.Path().c_str(), 1);
+    const pid_t child = fork();
+    if (child == 0) {
+        execl("/proc/self/exe", "window", "--gtest_filter=PicturesTest.ComesBackAfterAKill", nullptr);
+        _exit(1);
+    }
+    unsetenv(kKilled);
+    const bool underWay = Await([&] { return std::filesystem::exists(folder / "under way"); });
+    kill(child, SIGKILL);
+    EXPECT_EQ(AwaitEnd(child), 128 + SIGKILL);
+    ASSERT_TRUE(underWay);
+
+    app.Begin({});
+    AwaitExamined(1);
+    EXPECT_EQ(At(0).state, State::kInterrupted);
+    EXPECT_EQ(NameOf(At(0).target), "movie new.mp4");
+    EXPECT_FALSE(std::filesystem::exists(At(0).target));
+    app.TheQueue().Retry({At(0).id});
+    AwaitExamined(1);
+    app.TheDispatcher().Start();
+    ASSERT_TRUE(AwaitDone());
+    EXPECT_EQ(At(0).state, State::kDone) << At(0).outcome.sentence.toStdString();
+    EXPECT_TRUE(std::filesystem::exists(At(0).target));
+}
+
+TEST_F(PicturesTest, WaitsOnADiskThatIsFullUntilThereIsRoom) {
+    const SmallDisk disk(folder / "disk", "700k");
+    if (!disk.IsThere())
+        GTEST_SKIP() << "no mounts here";
+    app.TheQueue().SetNaming({QStringLiteral("{name}"), folder / "disk"});
+    app.TheQueue().Add({Holiday()});
+    AwaitExamined(1);
+    EXPECT_FALSE(At(0).findings.warnings.isEmpty()) << "the page warns that there is little room";
+    app.TheDispatcher().Start();
+    ASSERT_TRUE(Await([&] { return At(0).figures.phase == Phase::kWaitingForRoom || At(0).IsOver(); }));
+    EXPECT_EQ(At(0).state, State::kActive) << At(0).outcome.sentence.toStdString();
+    ASSERT_TRUE(disk.Grow());
+    ASSERT_TRUE(AwaitDone());
+    EXPECT_EQ(At(0).state, State::kDone) << At(0).outcome.sentence.toStdString();
+    EXPECT_GT(std::filesystem::file_size(At(0).target), 700'000U);
 }
