@@ -60,6 +60,7 @@ struct Warning {
         kSmallRoom,    ///< The output will probably not find enough room.
         kWaitsForRoom, ///< The disk is full; the conversion goes on when there is room, or ends by Stop.
         kChosen,       ///< What was chosen for Request::maxSize or Request::detectCrop.
+        kFailed,       ///< One of many movies failed; the others go on.
         kLeftover,     ///< Something of an earlier run is there and not used.
         kSource,       ///< Something was wrong with the source and has been put right or skipped.
     };

@@ -47,6 +47,7 @@ int64_t AvailableMemory() {
 Request RequestOf(const PieceOrder& order, const Plan& plan, int number, const std::string& file) {
     Request request = RequestFor(plan, number, file);
     request.onFull = order.onFull;
+    request.niceness = order.niceness;
     return request;
 }
 
@@ -75,6 +76,12 @@ public:
           job_(RequestOf(foreman.order_, plan, number, file_), *this) {}
 
     Job& Conversion() { return job_; }
+
+    /// Ends it; whatever it then has made is not the piece.
+    void Stop() {
+        stopped_ = true;
+        job_.Stop();
+    }
 
     /// Seconds of pictures that it brings; of the rest none, unless nothing else is made.
     double Length() const {
@@ -107,6 +114,8 @@ public:
         Verdict verdict = news;
         int64_t bytes = 0;
         try {
+            if (verdict.outcome == Outcome::kDone && stopped_)
+                verdict.outcome = Outcome::kStopped; // a source that is stopped seems to have ended
             if (verdict.outcome == Outcome::kDone) {
                 CheckCount(verdict);
                 bytes = SealPiece(file_, plan_, foreman_.order_.planPath, number_);
@@ -146,6 +155,7 @@ private:
     const Plan& plan_;
     const int number_;
     const std::string file_;
+    std::atomic<bool> stopped_{false};
     int64_t pictures_ = 0;
     mutable std::mutex mutex_;
     Progress latest_;
@@ -343,7 +353,8 @@ Verdict Foreman::MakeAll(const Plan& plan, std::deque<int> missing) {
         if (stop_ && verdict.outcome == Outcome::kDone)
             verdict.outcome = Outcome::kStopped;
         if (verdict.outcome != Outcome::kDone)
-            ForAll(&Job::Stop);
+            for (const auto& task : tasks_)
+                task->Stop();
         while (verdict.outcome == Outcome::kDone && !missing.empty() &&
                static_cast<int>(tasks_.size()) < jobs) {
             StartTask(plan, missing.front());

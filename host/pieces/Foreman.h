@@ -32,7 +32,8 @@ struct PieceOrder {
     bool replace = false;           ///< The output may replace a file.
     bool keepPieces = false;        ///< Leave them and the plan where they are afterwards.
     OnFull onFull = OnFull::kStop;
-    int jobs = 1; ///< Pieces at once; 0: as many as processors and memory allow.
+    int niceness = 0; ///< See Request.
+    int jobs = 1;     ///< Pieces at once; 0: as many as processors and memory allow.
 };
 
 /// The plan that a conversion in pieces keeps beside its output.

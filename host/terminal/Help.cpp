@@ -25,7 +25,7 @@ class HelpFormatter final : public CLI::Formatter {
 public:
     /// As a reader expects it; the library's own lists every positional's type.
     std::string make_usage(const CLI::App* /*app*/, std::string /*name*/) const override {
-        return "Usage: movieconv [OPTIONS] INPUT OUTPUT\n";
+        return "Usage: movieconv [OPTIONS] INPUT OUTPUT\n       movieconv --into FOLDER [OPTIONS] INPUT...\n";
     }
 
     std::string make_help(const CLI::App* app, std::string name, CLI::AppFormatMode mode) const override {

@@ -250,6 +250,18 @@ void AddPieces(CLI::App& app, Options& options) {
         ->group(group);
 }
 
+void AddMany(CLI::App& app, Options& options) {
+    const std::string group = "Many movies";
+    app.add_option(
+           "--into", options.into,
+           "Convert every INPUT, files and folders of them, into\nthis folder; what is there already is left")
+        ->type_name("FOLDER")
+        ->group(group);
+    app.add_option("--names", options.names, "Their outputs' names (default {name}.{ext})")
+        ->type_name("PATTERN")
+        ->group(group);
+}
+
 void AddOutput(CLI::App& app, Options& options) {
     const std::string group = "Output";
     app.add_flag("-y,--overwrite", options.request.overwrite,
@@ -335,10 +347,21 @@ void RequirePieces(const Options& options) {
         throw Failure(Category::kRequest, "--jobs converts many places at once and so excludes --preview");
 }
 
+void RequireMany(const Options& options) {
+    if (!options.into && (!options.further.empty() || options.names))
+        throw Failure(Category::kRequest, "more than INPUT and OUTPUT, and --names, go with --into");
+    if (options.into && (options.task != Task::kConvert || options.preview || options.resume ||
+                         options.request.split || options.division.pieces || options.division.length))
+        throw Failure(Category::kRequest,
+                      "--into converts many movies: it excludes --split, --preview, --resume, "
+                      "--pieces, --piece-length and what is done instead of converting");
+}
+
 void RequireSense(const Options& options) {
+    RequireMany(options);
     if (NeedsInput(options.task) && options.request.input.empty())
         throw Failure(Category::kRequest, "INPUT is missing; try \"movieconv --help\"");
-    if (NeedsOutput(options.task) && options.request.output.empty())
+    if (NeedsOutput(options.task) && !options.into && options.request.output.empty())
         throw Failure(Category::kRequest, "OUTPUT is missing; try \"movieconv --help\"");
     RequirePieces(options);
     if (options.request.noVideo && options.request.noAudio)
@@ -396,10 +419,12 @@ std::optional<Options> ParseOptions(int argc, char** argv) {
     app.add_option("INPUT", options.request.input, "The movie to convert, any that FFmpeg can read")
         ->type_name("");
     app.add_option("OUTPUT", options.request.output, "The file to make")->type_name("");
+    app.add_option("FURTHER", options.further)->type_name("")->group("");
     AddRange(app, options);
     AddEncoding(app, options);
     AddPictures(app, options);
     AddSound(app, options);
+    AddMany(app, options);
     AddPieces(app, options);
     AddOutput(app, options);
     AddReports(app, options);

@@ -25,8 +25,11 @@ struct Options {
 
     std::optional<std::string> plan; ///< Where a plan is to be written.
     Division division;
-    int piece = 0;           ///< The number of the one to make.
-    std::optional<int> jobs; ///< Pieces at once; 0: as many as pay.
+    int piece = 0;                    ///< The number of the one to make.
+    std::optional<int> jobs;          ///< Pieces at once; 0: as many as pay.
+    std::optional<std::string> into;  ///< The folder for many movies.
+    std::vector<std::string> further; ///< Movies beside INPUT and OUTPUT, which is one, too, then.
+    std::optional<std::string> names; ///< The pattern of their outputs' names.
     bool resume = false;
     bool keepPieces = false;
 

@@ -1,6 +1,7 @@
 #include "host/terminal/Session.h"
 
 #include "host/convert/Job.h"
+#include "host/pieces/Batch.h"
 #include "host/pieces/Foreman.h"
 
 #include <chrono>
@@ -15,11 +16,27 @@ constexpr std::chrono::milliseconds kTick{500};
 
 /// What the options ask for: one conversion, or pieces of it.
 std::unique_ptr<Work> MakeWork(const Options& options, Observer& observer, Loop loop) {
+    if (options.into) {
+        BatchOrder order;
+        order.request = options.request;
+        order.folder = *options.into;
+        order.jobs = options.jobs.value_or(1);
+        if (options.names)
+            order.names = *options.names;
+        order.inputs = options.further;
+        for (const std::string* name : {&options.request.output, &options.request.input})
+            if (!name->empty())
+                order.inputs.insert(order.inputs.begin(), *name);
+        order.request.input.clear();
+        order.request.output.clear();
+        return std::make_unique<Batch>(std::move(order), observer, std::move(loop));
+    }
     if (options.task == Task::kConvert && !options.jobs)
         return std::make_unique<Job>(options.request, observer, std::move(loop));
     PieceOrder order;
     order.keepPieces = options.keepPieces;
     order.onFull = options.request.onFull;
+    order.niceness = options.request.niceness;
     order.replace = options.request.overwrite;
     order.join = options.task != Task::kPiece;
     if (options.task == Task::kConvert) {

@@ -1,0 +1,54 @@
+// What was converted into a folder: by its lines it is known what need not be converted again.
+#ifndef MOVIECONV_HOST_PIECES_BATCHJOURNAL_H
+#define MOVIECONV_HOST_PIECES_BATCHJOURNAL_H
+
+#include "host/pieces/Plan.h"
+
+#include <map>
+#include <mutex>
+#include <string>
+
+namespace movieconv {
+
+/// One file that only grows, a JSON object a line, each with a check of its own. All functions may be called
+/// on any thread.
+class BatchJournal {
+public:
+    enum class State {
+        kUnknown, ///< Nothing is known of the output.
+        kBegun,   ///< It was begun from this source with these settings, and its end is not known.
+        kDone,    ///< It was made of this source with these settings, and still stands there.
+    };
+
+    /// Reads what is there. Throws Failure when it cannot be read.
+    explicit BatchJournal(const std::string& folder);
+
+    /// Lines that were cut, edited or are of something else.
+    int Damaged() const { return damaged_; }
+
+    /// `settings` is what SettingsAsJson gives, as text.
+    State StateOf(const std::string& output, const SourceMark& source, const std::string& settings) const;
+
+    /// Both throw Failure when the line cannot be written.
+    void NoteBegun(const std::string& output, const SourceMark& source, const std::string& settings);
+    void NoteDone(const std::string& output, const SourceMark& source, const std::string& settings);
+
+private:
+    struct Entry {
+        bool done = false;
+        std::string task;   ///< Hash of source and settings.
+        std::string result; ///< Hash of the output's mark, when it is done.
+    };
+
+    void Read(const std::string& text);
+    void Note(const std::string& output, const Entry& entry);
+
+    const std::string path_;
+    mutable std::mutex mutex_;
+    std::map<std::string, Entry> entries_; // by the output's name
+    int damaged_ = 0;
+};
+
+} // namespace movieconv
+
+#endif

@@ -1,0 +1,108 @@
+// The program with --into: many movies, what is done already left as it is.
+#include "tests/support/Folder.h"
+#include "tests/support/Program.h"
+#include "tests/support/TestMovies.h"
+
+#include <gtest/gtest.h>
+
+#include <filesystem>
+#include <string>
+#include <vector>
+
+namespace {
+
+using program::Call;
+using program::Result;
+using test_movies::Args;
+
+std::string Short() {
+    return test_movies::Make("many.mkv",
+                             test_movies::Join(test_movies::CountedPictures(1), test_movies::Beeps(1)));
+}
+
+bool Has(const std::string& text, const std::string& part) {
+    return text.find(part) != std::string::npos;
+}
+
+/// A folder "in" of two movies and a text, and a movie beside it.
+struct Movies {
+    Folder folder;
+    std::string out = folder / "out";
+
+    Movies() {
+        std::filesystem::create_directory(folder / "in");
+        for (const char* name : {"in/a.mkv", "in/b.mkv", "c.mkv"})
+            WriteFile(folder / name, ReadFile(Short()));
+        WriteFile(folder / "in/notes.txt", "not a movie");
+    }
+    Result Convert(const Args& more = {}) const {
+        return Call(test_movies::Join(Args{"--into", out, "--jobs", "2"}, more,
+                                      Args{folder / "in", folder / "c.mkv"}));
+    }
+    int64_t Written(const std::string& name) const {
+        return std::filesystem::last_write_time(out + "/" + name).time_since_epoch().count();
+    }
+};
+
+TEST(ManyMovies, AreConvertedOnceAndAgainOnlyWhereSomethingChanged) {
+    const Movies movies;
+    const Result first = movies.Convert();
+    ASSERT_EQ(first.code, 0) << first.err;
+    EXPECT_EQ(movies.folder.Names("out"),
+              (std::vector<std::string>{"a.mp4", "b.mp4", "c.mp4", "movieconv.journal"}));
+    EXPECT_TRUE(Has(first.err, "notes.txt\" is left out")) << first.err;
+    EXPECT_TRUE(Has(first.out, "in 3 files")) << first.out;
+
+    const int64_t before = movies.Written("a.mp4");
+    const Result second = movies.Convert();
+    ASSERT_EQ(second.code, 0) << second.err;
+    EXPECT_EQ(movies.Written("a.mp4"), before);
+    EXPECT_TRUE(Has(second.err, "a.mp4\" is there already")) << second.err;
+
+    EXPECT_EQ(movies.Convert({"--size", "80x60"}).code, 4) << "other settings would replace what is there";
+    EXPECT_EQ(movies.Convert({"--size", "80x60", "-y"}).code, 0);
+    EXPECT_NE(movies.Written("a.mp4"), before);
+    WriteFile(movies.folder / "in/a.mkv", ReadFile(Short()) + "more");
+    std::filesystem::remove(movies.out + "/b.mp4");
+    const Result third = movies.Convert({"--size", "80x60", "-y"});
+    EXPECT_TRUE(Has(third.out, "in 2 files")) << third.out << third.err;
+    EXPECT_EQ(movies.Convert({"--names", "{name}-small.{ext}", "-f", "mkv"}).code, 0);
+    EXPECT_TRUE(std::filesystem::exists(movies.out + "/c-small.mkv"));
+}
+
+TEST(ManyMovies, GoOnWhenOneFailsAndTellTheWorst) {
+    const Movies movies;
+    std::filesystem::create_directory(movies.out);
+    WriteFile(movies.out + "/a.mp4", "precious");
+    const Result result = movies.Convert({movies.folder / "nowhere.mkv"});
+    EXPECT_EQ(result.code, 4) << result.err;
+    EXPECT_TRUE(Has(result.err, "2 of 4 movies failed") || Has(result.err, "2 of 5 movies failed"))
+        << result.err;
+    EXPECT_EQ(ReadFile(movies.out + "/a.mp4"), "precious");
+    EXPECT_TRUE(std::filesystem::exists(movies.out + "/c.mp4"));
+}
+
+TEST(ManyMovies, BelieveNoLineOfTheJournalThatWasEdited) {
+    const Movies movies;
+    ASSERT_EQ(movies.Convert().code, 0);
+    const std::string journal = movies.out + "/movieconv.journal";
+    std::string text = ReadFile(journal);
+    const std::size_t last = text.rfind("\"state\":\"done\",\"output\":\"c.mp4\"");
+    ASSERT_NE(last, std::string::npos);
+    text[text.find("\"task\":\"", last) + 8] ^= 1;
+    WriteFile(journal, text + R"({"state":"do)"); // and one that was cut
+    const Result again = movies.Convert();
+    EXPECT_EQ(again.code, 0) << again.err;
+    EXPECT_TRUE(Has(again.err, "damaged and not believed")) << again.err;
+    EXPECT_TRUE(Has(again.out, "in one file")) << "c.mp4 alone had to be made again: " << again.out;
+}
+
+TEST(ManyMovies, NeedNamesOfTheirOwn) {
+    const Movies movies;
+    EXPECT_EQ(movies.Convert({"--names", "same.mp4"}).code, 2);
+    EXPECT_EQ(Call({"--into", movies.folder / "in", movies.folder / "in"}).code, 2);
+    EXPECT_EQ(Call({"--into", movies.out, "--split", "2", movies.folder / "c.mkv"}).code, 2);
+    EXPECT_EQ(Call({movies.folder / "c.mkv", movies.folder / "d.mp4", movies.folder / "in/a.mkv"}).code, 2);
+}
+
+} // namespace

@@ -1,0 +1,249 @@
+// The program's plans, pieces and joins, as a farm and as people use them.
+#include "tests/pieces/Packets.h"
+#include "tests/support/Folder.h"
+#include "tests/support/Program.h"
+#include "tests/support/TestMovies.h"
+
+#include <gtest/gtest.h>
+
+#include <csignal>
+#include <cstdlib>
+#include <fmt/format.h>
+#include <random>
+#include <string>
+#include <sys/stat.h>
+#include <unistd.h>
+#include <vector>
+
+namespace {
+
+using program::Call;
+using program::Result;
+using program::Running;
+using test_movies::Args;
+
+constexpr int kUsage = 2;
+constexpr int kCannotRead = 3;
+constexpr int kCannotWrite = 4;
+constexpr int kStopped = 6;
+
+/// Eight seconds, plain but for sound that ends early.
+std::string Source() {
+    return test_movies::Make("pieces.mkv",
+                             test_movies::Join(test_movies::CountedPictures(8), test_movies::Beeps(7.8),
+                                               Args{"-c:v", "libx264", "-preset", "ultrafast", "-g", "40",
+                                                    "-bf", "2", "-c:a", "aac"}));
+}
+
+/// A plan of four pieces and the sound.
+struct Planned {
+    Folder folder;
+    std::string plan = folder / "movie.plan";
+    std::string output = folder / "out.mp4";
+
+    Planned() {
+        const Result planned = Call({"--plan", plan, "--pieces", "4", Source(), output});
+        EXPECT_EQ(planned.code, 0) << planned.err;
+    }
+    std::string Piece(int number) const { return fmt::format("{}.{:04}.piece", plan, number); }
+    Result Make(int number) const { return Call({"-q", "--piece", std::to_string(number), plan}); }
+    void MakeAll() const {
+        for (const int number : {3, 0, 4, 1, 2}) {
+            const Result made = Make(number);
+            EXPECT_EQ(made.code, 0) << made.err;
+        }
+    }
+    Result Join() const { return Call({"-q", "--join", plan}); }
+};
+
+bool Has(const std::string& text, const std::string& part) {
+    return text.find(part) != std::string::npos;
+}
+
+TEST(Pieces, GiveTheSameBytesInAnyOrderAndInOneProcess) {
+    const Planned farm;
+    farm.MakeAll();
+    ASSERT_EQ(farm.Make(2).code, 0); // it is there already
+    ASSERT_EQ(Call({"-q", "--join", "--keep-pieces", farm.plan}).code, 0);
+    EXPECT_EQ(farm.folder.Names().size(), 7U);
+    const std::string bytes = ReadFile(farm.output);
+    std::filesystem::remove(farm.output);
+    ASSERT_EQ(farm.Join().code, 0);
+    EXPECT_EQ(farm.folder.Names(), (std::vector<std::string>{"movie.plan", "out.mp4"}));
+    EXPECT_EQ(ReadFile(farm.output), bytes);
+
+    const std::string whole = farm.folder / "whole.mp4";
+    ASSERT_EQ(Call({"-q", Source(), whole}).code, 0);
+    EXPECT_EQ(packets::Of(whole), packets::Of(farm.output));
+    for (const char* jobs : {"1", "2", "5"}) {
+        ASSERT_EQ(Call({"-q", "-y", "--jobs", jobs, "--pieces", "4", Source(), whole}).code, 0);
+        EXPECT_EQ(ReadFile(whole), bytes) << jobs << " pieces at once";
+    }
+    EXPECT_EQ(farm.folder.Names(), (std::vector<std::string>{"movie.plan", "out.mp4", "whole.mp4"}));
+}
+
+TEST(Pieces, ThatDoNotBelongTogetherAreRefusedByTheirNames) {
+    const Planned farm;
+    farm.MakeAll();
+    const auto refuses = [&](int number, const char* why) {
+        const Result joined = farm.Join();
+        EXPECT_EQ(joined.code, kCannotRead);
+        EXPECT_TRUE(Has(joined.err, fmt::format("piece {} (", number)) && Has(joined.err, why)) << joined.err;
+        EXPECT_FALSE(std::filesystem::exists(farm.output));
+    };
+    const std::string second = ReadFile(farm.Piece(1));
+    std::filesystem::remove(farm.Piece(1));
+    refuses(1, "is missing");
+    WriteFile(farm.Piece(1), second.substr(0, second.size() / 2));
+    refuses(1, "is cut off");
+    WriteFile(farm.Piece(1), ReadFile(farm.Piece(2)));
+    refuses(1, "is another piece under its name");
+    std::string changed = second;
+    changed[changed.size() / 2] ^= 1;
+    WriteFile(farm.Piece(1), changed);
+    refuses(1, "was changed since it was made");
+    const Planned other;
+    ASSERT_EQ(other.Make(1).code, 0);
+    WriteFile(farm.Piece(1), ReadFile(other.Piece(1)));
+    refuses(1, "belongs to another plan");
+    ASSERT_EQ(farm.Make(1).code, 0) << "a piece that is none is made again";
+    EXPECT_EQ(farm.Join().code, 0);
+}
+
+TEST(Pieces, ArePlannedOfNothingThatCannotBeReadTwice) {
+    const Folder folder;
+    const std::string plan = folder / "movie.plan";
+    const auto refuses = [&](const Args& arguments, int code, const char* why) {
+        const Result result = Call(test_movies::Join(Args{"-q", "--plan", plan}, arguments));
+        EXPECT_EQ(result.code, code) << result.err;
+        EXPECT_TRUE(Has(result.err, why)) << result.err;
+        EXPECT_FALSE(std::filesystem::exists(plan));
+    };
+    const std::string pipe = folder / "pipe.mkv";
+    ASSERT_EQ(mkfifo(pipe.c_str(), 0600), 0);
+    refuses({pipe, folder / "out.mp4"}, kCannotRead, "cannot be read once for every piece");
+    const std::string bare = test_movies::Make(
+        "bare.h264", test_movies::Join(test_movies::CountedPictures(2), Args{"-c:v", "libx264", "-bf", "2"}));
+    refuses({bare, folder / "out.mp4"}, kCannotRead, "only be converted undivided");
+    refuses({Source(), folder / "out.m4a"}, kUsage, "sound alone");
+    refuses({"--split", "2", Source(), folder / "out.mp4"}, kUsage, "clips");
+    refuses({"--pieces", "1000000", Source(), folder / "out.mp4"}, kUsage, "--pieces");
+    refuses({"--pieces", "2", "--piece-length", "3", Source(), folder / "out.mp4"}, kUsage, "exclude");
+    refuses({"--piece-length", "0.0001", Source(), folder / "out.mp4"}, kUsage, "0.001");
+}
+
+TEST(Pieces, TellWhenThePlanOrTheSourceWasChanged) {
+    const Planned farm;
+    const std::string plan = ReadFile(farm.plan);
+    const auto refuses = [&](std::string text, const char* why) {
+        WriteFile(farm.plan, text);
+        const Result result = farm.Make(0);
+        EXPECT_EQ(result.code, kUsage) << result.err;
+        EXPECT_TRUE(Has(result.err, why)) << result.err;
+        EXPECT_EQ(farm.folder.Names(), (std::vector<std::string>{"movie.plan"}));
+    };
+    const auto with = [&](const std::string& what, const std::string& instead) {
+        std::string text = plan;
+        const std::size_t at = text.find(what);
+        EXPECT_NE(at, std::string::npos) << what;
+        return text.replace(at, what.size(), instead);
+    };
+    refuses(plan.substr(0, plan.size() / 2), "only a part");
+    refuses(with("\"pictures\": 50", "\"pictures\": 51"), "was changed");
+    refuses(with("\"pictures\": 50", "\"pictures\": -1"), "not a number");
+    refuses(with("\"output\": \"", "\"output\": \"/tmp/.."), "absolute path");
+    refuses(with("\"path\": \"/", "\"path\": \""), "absolute path");
+    refuses(with("\"version\": 1", "\"version\": 2"), "version 2");
+    refuses("{}", "not a plan");
+    WriteFile(farm.plan, plan);
+    for (const char* number : {"5", "-1", "99999999999"})
+        EXPECT_EQ(Call({"-q", "--piece", number, farm.plan}).code, kUsage);
+
+    const std::string source = farm.folder / "source.mkv";
+    WriteFile(source, ReadFile(Source()));
+    ASSERT_EQ(Call({"-q", "-y", "--plan", farm.plan, "--pieces", "4", source, farm.output}).code, 0);
+    ASSERT_EQ(farm.Make(0).code, 0);
+    WriteFile(source, ReadFile(Source()) + "more");
+    EXPECT_EQ(farm.Make(1).code, kCannotRead);
+    std::filesystem::resize_file(source, 5000);
+    EXPECT_EQ(farm.Make(1).code, kCannotRead);
+    EXPECT_EQ(farm.Join().code, kCannotRead);
+}
+
+TEST(Pieces, NeverReplaceAnOutputWithoutLeave) {
+    const Planned farm;
+    farm.MakeAll();
+    WriteFile(farm.output, "precious");
+    EXPECT_EQ(farm.Join().code, kCannotWrite);
+    EXPECT_EQ(ReadFile(farm.output), "precious");
+    EXPECT_EQ(Call({"-q", "-y", "--join", farm.plan}).code, 0);
+    EXPECT_NE(ReadFile(farm.output), "precious");
+}
+
+/// A source whose pieces take long enough to be met at work.
+std::string LongSource() {
+    return test_movies::Make("long-pieces.mkv",
+                             {"-f", "lavfi", "-i", "testsrc2=s=640x360:r=25:d=40", "-f", "lavfi", "-i",
+                              "sine=d=40", "-c:v", "libx264", "-preset", "ultrafast", "-c:a", "aac"});
+}
+
+TEST(Pieces, EndOnASignalWithCodeSixAndLeaveNothing) {
+    const Folder folder;
+    const std::string plan = folder / "movie.plan";
+    ASSERT_EQ(Call({"-q", "--plan", plan, "--pieces", "1", LongSource(), folder / "out.mp4"}).code, 0);
+    Running piece({"--progress", "json", "--piece", "0", plan}, false);
+    ASSERT_TRUE(piece.WaitFor(R"("event":"progress")"));
+    piece.Signal(SIGTERM);
+    const Result result = piece.Finish();
+    EXPECT_EQ(result.code, kStopped) << result.out << result.err;
+    EXPECT_EQ(folder.Names(), (std::vector<std::string>{"movie.plan"}));
+}
+
+/// Killed at any moment, however often, the same command with --resume ends with the bytes of an undisturbed
+/// run.
+TEST(Pieces, GoOnAfterKills) {
+    const char* asked = std::getenv("MOVIECONV_KILLS");
+    const int kills = asked != nullptr ? std::atoi(asked) : 5;
+    const Folder folder;
+    const std::string calm = folder / "calm.mp4";
+    const std::string output = folder / "out.mp4";
+    const Args options{"-q", "--jobs", "2", "--pieces", "8", LongSource()};
+    ASSERT_EQ(Call(test_movies::Join(options, Args{calm})).code, 0);
+    std::mt19937 dice(7);
+    for (int i = 0; i < kills; ++i) {
+        Running run(test_movies::Join(options, Args{"--resume", output}), false);
+        usleep(dice() % 700'000);
+        run.Signal(SIGKILL);
+        run.Finish();
+        if (!std::filesystem::exists(output))
+            continue;
+        EXPECT_EQ(ReadFile(output), ReadFile(calm)) << "after " << i + 1 << " kills";
+        std::filesystem::remove(output);
+    }
+    const Result resumed = Call(test_movies::Join(options, Args{"-y", "--resume", output}));
+    ASSERT_EQ(resumed.code, 0) << resumed.err;
+    EXPECT_EQ(ReadFile(output), ReadFile(calm));
+    EXPECT_EQ(folder.Names(), (std::vector<std::string>{"calm.mp4", "out.mp4"})) << "something was left over";
+}
+
+TEST(Pieces, ResumeOnlyTheSameConversionAndTellWhatDiffers) {
+    const Planned farm;
+    const std::string plan = farm.output + ".plan";
+    ASSERT_EQ(Call({"-q", "--plan", plan, "--pieces", "4", Source(), farm.output}).code, 0);
+    ASSERT_EQ(Call({"-q", "--piece", "0", plan}).code, 0);
+    const Args options{"--jobs", "1", "--pieces", "4"};
+    const Result other =
+        Call(test_movies::Join(options, Args{"--resume", "--size", "80x60", Source(), farm.output}));
+    EXPECT_EQ(other.code, kUsage);
+    EXPECT_TRUE(Has(other.err, "settings size was nothing, now [80,60]")) << other.err;
+    const Result resumed =
+        Call(test_movies::Join(options, Args{"--resume", "--keep-pieces", Source(), farm.output}));
+    EXPECT_EQ(resumed.code, 0);
+    EXPECT_TRUE(Has(resumed.err, "1 of 5 pieces are made already")) << resumed.err;
+    const Result anew = Call(test_movies::Join(options, Args{"-y", Source(), farm.output}));
+    EXPECT_EQ(anew.code, 0);
+    EXPECT_TRUE(Has(anew.err, "with 5 pieces is left of an earlier run")) << anew.err;
+    EXPECT_FALSE(std::filesystem::exists(plan));
+}
+
+} // namespace
