@@ -161,6 +161,7 @@ int PieceWriter::AddStream(const MuxedStream& stream) {
     av::CheckMemory(avcodec_parameters_copy(parameters.get(), stream.parameters));
     State state{stream, std::move(parameters)};
     state.description.parameters = state.parameters.get();
+    // cppcheck-suppress danglingLifetime ; the parameters move along and stay where they are
     streams_.push_back(std::move(state));
     return StreamCount() - 1;
 }

@@ -135,12 +135,12 @@ typedef int (*WriterFullDiskHandler)(void* context, const WriterStatus* status);
 
 /// The display that HDR pictures were made for: chromaticities as in CIE 1931, luminances in cd/m2.
 typedef struct WriterMasteringDisplay {
-    double dRed[2]; ///< x, y
-    double dGreen[2];
-    double dBlue[2];
-    double dWhite[2];
-    double dDarkest;
-    double dBrightest;
+    double dRed[2];    ///< x, y
+    double dGreen[2];  ///< Likewise.
+    double dBlue[2];   ///< Likewise.
+    double dWhite[2];  ///< Likewise.
+    double dDarkest;   ///< Luminance.
+    double dBrightest; ///< Luminance.
 } WriterMasteringDisplay;
 
 /// Options for files; all zero but the size is the default.
@@ -175,18 +175,17 @@ typedef struct WriterOptions {
     /// Bits of a picture's components: 8, which is also what 0 means, or 10 where the codec takes them; see
     /// MWGetPictureDepth. Pictures that come with another depth are brought to it.
     int32_t nDepth;
-    int32_t bMasteringDisplay; ///< Nonzero: `masteringDisplay` goes into the file.
-    WriterMasteringDisplay masteringDisplay;
-    int32_t nBrightestPixel;   ///< cd/m2 of the brightest pixel of all pictures; 0: not known.
-    int32_t nBrightestPicture; ///< cd/m2, the highest average of a picture; 0: not known.
+    int32_t bMasteringDisplay;               ///< Nonzero: `masteringDisplay` goes into the file.
+    WriterMasteringDisplay masteringDisplay; ///< Of HDR pictures.
+    int32_t nBrightestPixel;                 ///< cd/m2 of the brightest pixel of all pictures; 0: not known.
+    int32_t nBrightestPicture;               ///< cd/m2, the highest average of a picture; 0: not known.
     /// Nonzero, kWriterPiece...: what is created is not the file but a piece of it, which MWJoinPieces takes.
     int32_t nPiece;
     int32_t
         bPieceContinues; ///< Nonzero: a picture of the file is shown before this piece's; see llPieceTick.
-    /// Where a piece with pictures lies in the file, in 100 ns units: its first picture, and the first of the
-    /// piece that follows, -1 for the last one.
+    /// Where a piece with pictures lies in the file, in 100 ns units: its first picture.
     int64_t llPieceBegin;
-    int64_t llPieceEnd;
+    int64_t llPieceEnd;  ///< The first picture of the piece that follows, -1 for the last one.
     int64_t llPieceTick; ///< As MWPlanTicks tells it for the piece's first picture.
 } WriterOptions;
 
@@ -287,7 +286,7 @@ typedef struct WriterTrack {
     int32_t nBitsPerSample;                      ///< Likewise.
     int32_t nBitrate;                            ///< Likewise; 0 or less: as in EncodeParam.
     const struct AVCodecParameters* pParameters; ///< FFmpeg's, of the version that the writer uses; or null.
-    WriterTrackReader pfnNext;
+    WriterTrackReader pfnNext;                   ///< Asked for its items.
     void* pContext; ///< Its first argument. Both have to last until the last file of the set is closed.
 } WriterTrack;
 
@@ -331,18 +330,18 @@ int MWGetThreadFileStatus(WriterStatus* status);
 int MWPlanTicks(const EncodeParam* param, const VideoFormat* video, const int64_t* times, int64_t count,
                 int64_t* ticks);
 
-#define kWriterNoTick INT64_MIN
+#define kWriterNoTick INT64_MIN ///< No picture is shown before this one.
 
 /// What MWJoinPieces makes a file of.
 typedef struct WriterJoin {
     uint32_t nSize MW_SIZE_OF(WriterJoin); ///< Size of this record in bytes.
-    int32_t nPieces;
+    int32_t nPieces;                       ///< Paths in `pszPieces`.
     /// Paths of the pieces: those with pictures in their order, then the rest.
     const char* const* pszPieces;
     int64_t llSourceBegin; ///< Where the file's first picture stands in the source, in 100 ns units.
     /// Told the share done, 0 to 1, now and then. 0 ends the work, and the file fails. May be null.
     int (*pfnGoesOn)(void* context, double share);
-    void* pContext;
+    void* pContext; ///< The first argument of `pfnGoesOn`.
 } WriterJoin;
 
 /// Makes one file of pieces, as MWCreateMediaFile and all that follows would have made it: the listener hears

@@ -135,7 +135,7 @@ TEST(Pieces, ArePlannedOfNothingThatCannotBeReadTwice) {
 TEST(Pieces, TellWhenThePlanOrTheSourceWasChanged) {
     const Planned farm;
     const std::string plan = ReadFile(farm.plan);
-    const auto refuses = [&](std::string text, const char* why) {
+    const auto refuses = [&](const std::string& text, const char* why) {
         WriteFile(farm.plan, text);
         const Result result = farm.Make(0);
         EXPECT_EQ(result.code, kUsage) << result.err;
