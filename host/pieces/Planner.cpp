@@ -73,7 +73,7 @@ std::optional<Stamps> ReadStamps(Movie& movie, const Request& request, bool (*st
     Stamps stamps;
     for (const VideoImage* picture = pictures.GetCurrentImage(); picture != nullptr;
          picture = pictures.DecodeNext(1) > 0 ? pictures.GetCurrentImage() : nullptr) {
-        stamps.times.push_back(picture->llTime);
+        stamps.times.push_back(+picture->llTime); // a copy: the record is packed
         stamps.repaired.push_back(movie.StampIsRepaired());
         stamps.end = picture->llTime + picture->nDuration;
         if (stamps.times.size() % kAskEvery == 0 && stopped != nullptr && stopped(context))

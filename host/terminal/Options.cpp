@@ -223,7 +223,7 @@ void AddPieces(CLI::App& app, Options& options) {
               "Divide into pieces of this length")
         ->type_name("TIME")
         ->group(group);
-    app.add_flag("--resume", options.resume, "Go on with what an earlier run of the same command left")
+    app.add_flag("--resume", options.resume, "Go on with what the same command has left earlier")
         ->group(group);
     app.add_option_function<std::string>(
            "--plan",
