@@ -1,6 +1,7 @@
 #include "writer/BesideStage.h"
 
 #include "media/MediaRecords.h"
+#include "writer/PacketTracks.h"
 #include "writer/SoundStage.h"
 
 #include <algorithm>
@@ -78,12 +79,15 @@ private:
     bool started_ = false;
 };
 
-} // namespace
-
+/// Makes what the plan says, for the container. Throws WriterFailure.
 std::unique_ptr<BesideTrack> MakeBesideTrack(const TrackPlan& plan, const Container& container,
                                              EncoderFlags flags) {
-    return std::make_unique<EncodedSound>(plan, container, flags);
+    if (plan.sound)
+        return std::make_unique<EncodedSound>(plan, container, flags);
+    return MakePacketTrack(*plan.track, container);
 }
+
+} // namespace
 
 BesideStage::BesideStage()
     : thread_(kMostSteps, 0,
@@ -152,8 +156,9 @@ void BesideStage::Read(Track& track, const Step& step) {
     WriterTrackItem item{};
     while (!thread_.Cancelled() && next(item))
         if (!track.writer->Take(item, item.llTime - *begin_))
-            break;
-    track.writer->Reach(step.time - *begin_);
+            return;
+    if (!step.closing)
+        track.writer->Reach(std::min(step.time, item.llTime) - *begin_);
 }
 
 } // namespace writer

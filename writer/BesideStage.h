@@ -48,10 +48,6 @@ public:
     virtual void Join() = 0;
 };
 
-/// Makes what the plan says, for the container. Throws WriterFailure.
-std::unique_ptr<BesideTrack> MakeBesideTrack(const TrackPlan& plan, const Container& container,
-                                             EncoderFlags flags);
-
 /// All functions but Cancel are called on one thread.
 class BesideStage {
 public:

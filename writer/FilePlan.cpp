@@ -204,7 +204,7 @@ std::vector<TrackPlan> MakeTrackPlans(const EncodeParam& param, const FilePlan& 
                 own.nAudioBitrate = static_cast<int32_t>(track.bitrate);
             plans.push_back({&track, MakeSoundPlan(own, {}, container)});
         } else if (track.parameters &&
-                   CarriesPackets(container, avcodec_get_name(track.parameters->codec_id))) {
+                   PacketForm(container, track.parameters->codec_id) != AV_CODEC_ID_NONE) {
             plans.push_back({&track, std::nullopt});
         }
     }

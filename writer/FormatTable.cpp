@@ -5,6 +5,7 @@
 
 extern "C" {
 #include <libavformat/avformat.h>
+#include <libavutil/avstring.h>
 }
 
 #include <algorithm>
@@ -90,33 +91,36 @@ constexpr uint32_t kChapters = kWriterFormatChapters;
 constexpr uint32_t kCover = kWriterFormatCover;
 constexpr uint32_t kFiles = kWriterFormatAttachments;
 constexpr uint32_t kTracks = kWriterFormatTracks;
+constexpr const char* kMp4Subtitles = "mov_text";
+constexpr const char* kMatroskaSubtitles = "subrip,ass,ssa,text,webvtt,hdmv_pgs_subtitle,hdmv_text_subtitle,"
+                                           "dvd_subtitle,dvb_subtitle";
 constexpr const char* kClusters = "cluster_time_limit=1000"; // what is lost at most when a file is cut off
 constexpr std::array kContainers{
     Container{FourCC("MP4 "), "MP4 (MPEG-4 Part 14)", "mp4,m4v", "mp4", kFragmented, nullptr,
-              kTags | kChapters | kCover | kTracks, nullptr, false,
+              kTags | kChapters | kCover | kTracks, kMp4Subtitles, false,
               {kXvid, kH264, kHevc, kMjpg, kVp9, kMpeg2, kAv1}, {kAac, kMp3, kAc3, kOpus, kVorbis}},
     Container{FourCC("MOV "), "QuickTime", "mov,qt", "mov", kFragmented, nullptr,
-              kTags | kChapters | kTracks, nullptr, false,
+              kTags | kChapters | kTracks, kMp4Subtitles, false,
               {kXvid, kH264, kHevc, kMjpg, kMpeg2}, {kAac, kMp3, kAc3, kAlac, kPcm}},
     Container{FourCC("MKV "), "Matroska", "mkv", "matroska", kStreamed, kClusters,
-              kTags | kChapters | kCover | kFiles | kTracks, nullptr, false,
+              kTags | kChapters | kCover | kFiles | kTracks, kMatroskaSubtitles, false,
               {kXvid, kH264, kHevc, kMjpg, kVp8, kVp9, kMpeg2, kFlv1, kAv1, kFfv1},
               {kAac, kMp3, kAc3, kFlac, kOpus, kVorbis, kAlac, kMp2, kPcm}},
     Container{FourCC("AVI "), "AVI (Audio Video Interleaved)", "avi,divx", "avi", kSteadyRate, nullptr,
               kTags | kTracks, nullptr, false,
               {kXvid, kH264, kMjpg, kVp8, kMpeg2, kFlv1}, {kMp3, kAac, kAc3, kPcm}},
     Container{FourCC("WEBM"), "WebM", "webm", "webm", kStreamed, kClusters,
-              kTags | kChapters | kTracks, nullptr, false, {kVp8, kVp9, kAv1}, {kVorbis, kOpus}},
+              kTags | kChapters | kTracks, "webvtt", false, {kVp8, kVp9, kAv1}, {kVorbis, kOpus}},
     Container{FourCC("FLV "), "Flash Video", "flv", "flv", kStreamed, nullptr,
               kTags, nullptr, false, {kH264, kFlv1}, {kAac, kMp3}},
     Container{FourCC("TS  "), "MPEG transport stream", "ts,m2ts,mts", "mpegts", kStreamed, nullptr,
-              kTags | kTracks, nullptr, false,
+              kTags | kTracks, "dvb_subtitle", false,
               {kH264, kHevc, kXvid, kMpeg2}, {kAac, kMp3, kAc3, kOpus, kMp2}},
     Container{FourCC("MPG "), "MPEG program stream", "mpg,mpeg,vob", "vob", kStreamed, nullptr,
               0, nullptr, false, {kMpeg2}, {kMp2, kAc3}},
     Container{kGif, "GIF (animated)", "gif", "gif", kStreamed, nullptr, 0, nullptr, false, {kGif}, {}},
     Container{FourCC("M4A "), "MPEG-4 audio", "m4a,m4b", "ipod", kFragmented, nullptr,
-              kTags | kChapters | kCover | kTracks, nullptr, false, {}, {kAac, kAc3, kAlac}},
+              kTags | kChapters | kCover | kTracks, kMp4Subtitles, false, {}, {kAac, kAc3, kAlac}},
     Container{FourCC("MP3 "), "MP3", "mp3", "mp3", kStreamed, nullptr,
               kTags | kCover, nullptr, false, {}, {kMp3}},
     Container{FourCC("WAV "), "WAV (RIFF wave)", "wav", "wav", kSteadyRate, "rf64=auto",
@@ -251,8 +255,22 @@ const AVCodec* FindEncoder(const SoundCodec& codec, int bitsPerSample) {
     }
 }
 
-bool CarriesPackets(const Container& /*container*/, const char* /*codec*/) {
-    return false;
+AVCodecID PacketForm(const Container& container, AVCodecID codec) {
+    if (container.subtitles == nullptr)
+        return AV_CODEC_ID_NONE;
+    const AVCodecDescriptor* descriptor = avcodec_descriptor_get(codec);
+    if (descriptor == nullptr || descriptor->type != AVMEDIA_TYPE_SUBTITLE)
+        return AV_CODEC_ID_NONE;
+    if (av_match_list(descriptor->name, container.subtitles, ',') > 0)
+        return codec;
+    const std::string list(container.subtitles);
+    const AVCodecDescriptor* usual = avcodec_descriptor_get_by_name(list.substr(0, list.find(',')).c_str());
+    const bool bothTexts =
+        usual != nullptr && (usual->props & descriptor->props & AV_CODEC_PROP_TEXT_SUB) != 0;
+    const bool convertible = bothTexts && codec != AV_CODEC_ID_EIA_608 &&
+                             avcodec_find_decoder(codec) != nullptr &&
+                             avcodec_find_encoder(usual->id) != nullptr;
+    return convertible ? usual->id : AV_CODEC_ID_NONE;
 }
 
 const Carriage& FindCarriage(const Container& container, uint32_t codec) {

@@ -112,8 +112,9 @@ bool TakesDeep(const PictureCodec& codec);
 const AVCodec* FindEncoder(const PictureCodec& codec);
 const AVCodec* FindEncoder(const SoundCodec& codec, int bitsPerSample);
 
-/// Whether packets of the codec with that name of FFmpeg's can be carried, or subtitles in it as others.
-bool CarriesPackets(const Container& container, const char* codec);
+/// The codec as which the container carries packets of another one: the same, or for subtitles of text the
+/// one that it prefers. AV_CODEC_ID_NONE when it does not carry them.
+AVCodecID PacketForm(const Container& container, AVCodecID codec);
 
 /// How the container carries the codec.
 const Carriage& FindCarriage(const Container& container, uint32_t codec);

@@ -1,5 +1,6 @@
 #include "writer/Fragments.h"
 
+#include "writer/TextRows.h"
 #include "writer/WriterFailure.h"
 #include "writer/WriterStatus.h"
 
@@ -10,6 +11,7 @@
 #include <cstring>
 #include <new>
 #include <numeric>
+#include <optional>
 
 namespace writer {
 namespace {
@@ -134,6 +136,38 @@ std::vector<uint8_t> ReadStart(ByteFile& file, const PlacedPacket& packet) {
     return start;
 }
 
+bool IsText(const PacketWriter& written, int stream) {
+    return stream >= 0 && stream < written.StreamCount() &&
+           written.Stream(stream).description.parameters->codec_id == AV_CODEC_ID_MOV_TEXT;
+}
+
+/// Gives the texts to the index, before all else: the multiplexer puts samples of its own wherever the times
+/// of another stream pass a text's end. They have no place in the file.
+TextRows AddTexts(const FragmentLog& log, const PacketWriter& written, int64_t size, Mp4Index& index) {
+    TextRows rows;
+    std::optional<PacketWriter::Written> text;
+    for (int stream = 0; stream < written.StreamCount(); ++stream)
+        if (IsText(written, stream))
+            text = written.Stream(stream);
+    if (!text)
+        return rows;
+    int64_t end = 0;
+    log.ForEach([&](const PlacedPacket& packet) {
+        if (packet.position + packet.size > size || packet.stream < 0 ||
+            packet.stream >= written.StreamCount())
+            ThrowIncomplete();
+        if (IsText(written, packet.stream))
+            rows.Add(packet);
+        else
+            end = std::max(end, av_rescale_q(packet.pts + packet.duration,
+                                             written.Stream(packet.stream).description.unit,
+                                             text->description.unit));
+    });
+    for (const PlacedPacket& packet : rows.Make(text->delay, end))
+        index.Add(packet);
+    return rows;
+}
+
 /// Throws WriterFailure when the index of `file` does not name all that `written` took: the multiplexer
 /// leaves out without a word what it has no memory for.
 void CheckIndex(ByteFile& file, const PacketWriter& written) {
@@ -163,14 +197,18 @@ void FinishFragments(const std::shared_ptr<ByteFile>& part, const PacketWriter& 
     const auto makeIndex = [&](int64_t place) {
         Mp4Index index(container, bitExact, extras);
         AddStreams(*input, written, index);
+        const TextRows texts = AddTexts(log, written, end, index);
         log.ForEach([&](const PlacedPacket& packet) {
+            if (IsText(written, packet.stream))
+                return;
             if (packet.position + packet.size > end)
                 ThrowIncomplete();
             progress(static_cast<double>(packet.position) / static_cast<double>(end));
             index.Add(packet, index.WantsContent(packet) ? ReadStart(*part, packet) : std::vector<uint8_t>{});
         });
         for (int stream = 0; stream < written.StreamCount(); ++stream)
-            if (index.Packets(stream) != written.Stream(stream).packets)
+            if ((IsText(written, stream) ? texts.Texts(stream) : index.Packets(stream)) !=
+                written.Stream(stream).packets)
                 ThrowIncomplete();
         return index.Finish(place);
     };

@@ -222,7 +222,11 @@ int MWAddTrack(uint32_t set, const WriterTrack* track) {
 int MWCarriesPackets(uint32_t format, const char* codec) {
     return Guarded(0, [&] {
         const writer::Container* container = writer::FindContainer(format);
-        return container != nullptr && codec != nullptr && writer::CarriesPackets(*container, codec) ? 1 : 0;
+        const AVCodecDescriptor* known = codec != nullptr ? avcodec_descriptor_get_by_name(codec) : nullptr;
+        return container != nullptr && known != nullptr &&
+                       writer::PacketForm(*container, known->id) != AV_CODEC_ID_NONE
+                   ? 1
+                   : 0;
     });
 }
 

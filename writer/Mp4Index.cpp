@@ -85,7 +85,9 @@ Mp4Index::~Mp4Index() = default;
 
 int64_t Mp4Index::MostTexts(const Extras& extras) {
     constexpr int64_t kPerText = 64;
-    return std::accumulate(extras.chapters.begin(), extras.chapters.end(), int64_t{0},
+    // The multiplexer ends the texts of each track with an empty one.
+    const auto ends = static_cast<int64_t>(extras.tracks.size()) * kPerText;
+    return std::accumulate(extras.chapters.begin(), extras.chapters.end(), ends,
                            [](int64_t sum, const Chapter& chapter) {
                                return sum + kPerText + static_cast<int64_t>(chapter.title.size());
                            });

@@ -269,7 +269,8 @@ typedef struct WriterTrackItem {
 } WriterTrackItem;
 
 /// Asks the host for the next item of a track, which begins before `until` in the source. 0 when there is
-/// none at hand: it is asked again when the file has come further. For `closing` the file ends there, and the
+/// none at hand: it is asked again when the file has come further; `item->llTime` is then where the next one
+/// begins at the earliest. For `closing` the file ends there, and the
 /// host waits for its source until it is sure; it may know better than `until` where that end is. Items come
 /// in their order, sound without gaps, and stay valid until the next call. Called on one thread of the
 /// writer's at a time, for one file after the other.

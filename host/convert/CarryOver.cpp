@@ -1,6 +1,7 @@
 #include "host/convert/CarryOver.h"
 
 #include "host/convert/CodecPlan.h"
+#include "media/FourCC.h"
 #include "media/MediaRecords.h"
 #include "writer/WriterStatus.h"
 
@@ -20,6 +21,12 @@ constexpr std::string_view kChapterTrack = "bin_data"; // MP4 holds the chapters
 
 int64_t Ticks(double seconds) {
     return std::llround(seconds * kTicksPerSecond);
+}
+
+/// "MP4" of "MP4 (MPEG-4 Part 14)".
+std::string NameOf(const FileFormatInfo& format) {
+    const std::string name = format.szName;
+    return name.substr(0, name.find(" ("));
 }
 
 int Dispositions(const StreamFlags& flags) {
@@ -51,10 +58,9 @@ void CarryTexts(const SourceInfo& source, uint32_t set) {
 
 int TakeNext(void* context, int64_t until, int closing, WriterTrackItem* item) {
     BesideTrack::Item found;
-    if (!static_cast<BesideTrack*>(context)->Next(until, closing != 0, found))
-        return 0;
+    const bool any = static_cast<BesideTrack*>(context)->Next(until, closing != 0, found);
     *item = {found.sound, found.packet, found.time, found.duration};
-    return 1;
+    return any ? 1 : 0;
 }
 
 /// Adds the tracks that are read beside what the engine converts.
@@ -73,6 +79,12 @@ public:
         track.nBitsPerSample = stream.sound->bitsPerSample;
         track.nBitrate = plan.rate.value_or(0);
         Add(track, movie_.ReadSoundBeside(stream.index), stream);
+    }
+
+    void AddPackets(const StreamInfo& stream) {
+        WriterTrack track{};
+        track.pParameters = movie_.StreamOf(stream.index).codecpar;
+        Add(track, movie_.ReadPacketsBeside(stream.index), stream);
     }
 
 private:
@@ -100,9 +112,9 @@ bool BelongTogether(const StreamInfo& one, const StreamInfo& other) {
 /// Why a stream of sound beside the engine's stays behind; empty when it does not.
 std::string WhySoundStays(const SourceInfo& source, const StreamInfo& stream, const FileFormatInfo& format) {
     if (format.bHasAudio == 0)
-        return fmt::format("{} cannot hold it", format.szName);
+        return fmt::format("{} cannot hold it", NameOf(format));
     if ((MWGetFormatTraits(format.fccFormat) & kWriterFormatTracks) == 0)
-        return fmt::format("{} holds one track of sound, MKV and MP4 hold several", format.szName);
+        return fmt::format("{} holds one track of sound, MKV and MP4 hold several", NameOf(format));
     if (!stream.decodable || !stream.sound || stream.sound->sampleRate <= 0 || stream.sound->channels <= 0)
         return "it cannot be decoded";
     if (source.pictures && !BelongTogether(StreamAt(source, source.pictures->index), stream))
@@ -128,6 +140,15 @@ bool CarryFile(const Movie& movie, const StreamInfo& stream, uint32_t set) {
 }
 
 /// Empty when the stream was carried, or is of a kind of which the source itself tells.
+/// Why subtitles stay behind; empty when they do not.
+std::string WhySubtitlesStay(const StreamInfo& stream, const FileFormatInfo& format) {
+    constexpr uint32_t kMatroska = FourCC("MKV ");
+    if (MWCarriesPackets(format.fccFormat, stream.codec.c_str()) != 0)
+        return {};
+    const bool matroskaCan = MWCarriesPackets(kMatroska, stream.codec.c_str()) != 0;
+    return fmt::format("{} cannot hold them{}", NameOf(format), matroskaCan ? ", MKV can" : "");
+}
+
 std::string ReasonFor(const Movie& movie, const StreamInfo& stream, const FileFormatInfo& format,
                       uint32_t set, bool& hasCover) {
     const uint32_t traits = MWGetFormatTraits(format.fccFormat);
@@ -141,21 +162,21 @@ std::string ReasonFor(const Movie& movie, const StreamInfo& stream, const FileFo
             return {};
         return WhySoundStays(movie.Info(), stream, format);
     case StreamKind::kSubtitles:
-        return "subtitles are not converted";
+        return WhySubtitlesStay(stream, format);
     case StreamKind::kData:
         if (stream.codec == kChapterTrack && !movie.Info().chapters.empty())
             return {};
         return "data streams are not converted";
     case StreamKind::kCover:
         if ((traits & kWriterFormatCover) == 0)
-            return fmt::format("{} cannot hold it", format.szName);
+            return fmt::format("{} cannot hold it", NameOf(format));
         if (hasCover)
             return "only one cover is carried";
         hasCover = CarryFile(movie, stream, set);
         return hasCover ? "" : "it is neither JPEG nor PNG";
     case StreamKind::kAttachment:
         if ((traits & kWriterFormatAttachments) == 0)
-            return fmt::format("{} cannot hold it", format.szName);
+            return fmt::format("{} cannot hold it", NameOf(format));
         return CarryFile(movie, stream, set) ? "" : "it has no name or no content";
     }
     return {};
@@ -182,7 +203,7 @@ std::vector<NotCarried> CarryOver(Movie& movie, const Request& request, const Fi
         const int wrong = CarryChapters(source, writerSet);
         if (!can)
             left.push_back(
-                {"chapters", std::nullopt, {}, {}, fmt::format("{} cannot hold them", format.szName)});
+                {"chapters", std::nullopt, {}, {}, fmt::format("{} cannot hold them", NameOf(format))});
         else if (wrong != 0)
             left.push_back(
                 {"chapters", std::nullopt, {}, {}, fmt::format("{} of them have no length", wrong)});
@@ -190,6 +211,9 @@ std::vector<NotCarried> CarryOver(Movie& movie, const Request& request, const Fi
     FurtherTracks tracks(movie, request, format, writerSet);
     for (const int stream : FurtherSound(source, format))
         tracks.AddSound(StreamAt(source, stream));
+    for (const StreamInfo& stream : source.streams)
+        if (stream.kind == StreamKind::kSubtitles && WhySubtitlesStay(stream, format).empty())
+            tracks.AddPackets(stream);
     bool hasCover = false;
     for (const StreamInfo& stream : source.streams) {
         std::string reason = ReasonFor(movie, stream, format, writerSet, hasCover);

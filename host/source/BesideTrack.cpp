@@ -17,6 +17,7 @@ bool BesideTrack::Next(int64_t until, bool closing, Item& item) {
         until = fileEnd != BesideBounds::kOpen || !bounds_.ends ? fileEnd : until;
     }
     bool found = false;
+    item.time = until;
     failures_.Attempt([&] { found = Find(until, closing, item); });
     return found;
 }
@@ -105,6 +106,11 @@ BesidePackets::BesidePackets(Source source, Clock clock, AVRational timeBase, co
       timeBase_(timeBase),
       fileBegin_(bounds.begin) {}
 
+void BesidePackets::Precede(std::vector<av::Packet> packets) {
+    for (av::Packet& packet : packets)
+        Hold(std::move(packet));
+}
+
 bool BesidePackets::Find(int64_t until, bool closing, Item& item) {
     KeepDivided();
     while (pending_.empty() || pending_.back().begin < until) {
@@ -123,9 +129,10 @@ bool BesidePackets::Find(int64_t until, bool closing, Item& item) {
         pending_.pop_front();
         divides_ = closing && current_.end > until;
         item = {nullptr, current_.packet.get(), current_.begin,
-                current_.Ends() ? std::min(current_.end, until) - current_.begin : 0};
+                current_.Ends() ? (divides_ ? until : current_.end) - current_.begin : 0};
         return true;
     }
+    item.time = any ? pending_.front().begin : until;
     if (closing)
         BeginFile(until);
     return false;
@@ -161,6 +168,13 @@ void BesidePackets::Hold(av::Packet packet) {
     }
     latest_ = std::max(latest_, held.begin);
     if (held.Ends() && held.end <= fileBegin_)
+        return;
+    const bool isKnown = std::any_of(pending_.begin(), pending_.end(), [&](const Held& other) {
+        return other.begin == held.begin && other.end == held.end &&
+               other.packet->size == held.packet->size &&
+               std::equal(held.packet->data, held.packet->data + held.packet->size, other.packet->data);
+    });
+    if (isKnown && held.begin < bounds_.begin)
         return;
     const auto later = std::upper_bound(pending_.begin(), pending_.end(), held.begin,
                                         [](int64_t time, const Held& other) { return time < other.begin; });

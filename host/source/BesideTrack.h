@@ -46,7 +46,8 @@ public:
 
     /// The next item that begins before `until`; false when there is none at hand, for `closing`: when there
     /// is none that belongs into the file, which ends at `until` unless the bounds say otherwise. What comes
-    /// afterwards belongs to the next file.
+    /// afterwards belongs to the next file. `item.time` is then where the next one begins at the earliest, as
+    /// far as that is known.
     bool Next(int64_t until, bool closing, Item& item);
 
 protected:
@@ -99,6 +100,9 @@ public:
 
     BesidePackets(Source source, Clock clock, AVRational timeBase, const BesideBounds& bounds,
                   Failures& failures);
+
+    /// Packets from before the begin, which the source may give once more.
+    void Precede(std::vector<av::Packet> packets);
 
 private:
     struct Held {

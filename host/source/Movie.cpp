@@ -1,5 +1,6 @@
 #include "host/source/Movie.h"
 
+#include "host/source/EarlierCues.h"
 #include "host/source/MediaTime.h"
 
 #include <fmt/format.h>
@@ -51,7 +52,23 @@ BesidePackets& Movie::ReadPacketsBeside(int stream) {
         StreamOf(stream).time_base, bounds_, failures_);
     BesidePackets& made = *track;
     AddBeside(stream, std::move(track));
+    if (bounds_.begin > 0)
+        made.Precede(std::move(EarlierCues()[stream]));
     return made;
+}
+
+/// Of all subtitles, read once.
+std::map<int, std::vector<av::Packet>>& Movie::EarlierCues() {
+    if (std::exchange(earlierCuesRead_, true) || !source_.Reader().IsSeekable())
+        return earlierCues_;
+    std::vector<int> subtitles;
+    for (const StreamInfo& stream : Info().streams)
+        if (stream.kind == StreamKind::kSubtitles)
+            subtitles.push_back(stream.index);
+    const int main = Info().pictures ? Info().pictures->index : Info().sound->index;
+    MovieReader again(Info().path, choice_.playlists, std::make_shared<Interruption>());
+    earlierCues_ = ReadEarlierCues(again, main, std::move(subtitles), bounds_.begin);
+    return earlierCues_;
 }
 
 void Movie::AddBeside(int stream, std::unique_ptr<BesideTrack> track) {

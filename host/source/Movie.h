@@ -10,6 +10,7 @@
 #include "host/source/SoundDecoder.h"
 #include "host/source/Source.h"
 
+#include <map>
 #include <memory>
 #include <optional>
 #include <string>
@@ -87,6 +88,7 @@ public:
     std::vector<std::string> Complaints() const;
 
 private:
+    std::map<int, std::vector<av::Packet>>& EarlierCues();
     void AddBeside(int stream, std::unique_ptr<BesideTrack> track);
 
     const SourceChoice choice_;
@@ -97,6 +99,8 @@ private:
     std::unique_ptr<PictureStamps> stamps_; // instead of pictures_
     std::unique_ptr<SoundDecoder> sound_;
     BesideBounds bounds_;
+    std::map<int, std::vector<av::Packet>> earlierCues_; // by stream, from before the begin
+    bool earlierCuesRead_ = false;
     std::vector<int> besideStreams_;
     std::vector<std::unique_ptr<BesideTrack>> beside_;
 };

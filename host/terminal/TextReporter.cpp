@@ -6,6 +6,8 @@
 #include <array>
 #include <cmath>
 #include <fmt/format.h>
+#include <string_view>
+#include <utility>
 
 namespace movieconv {
 namespace {
@@ -33,6 +35,23 @@ std::string Bar(double percent) {
     const int filled = std::clamp(static_cast<int>(percent / 100 * kBarColumns), 0, kBarColumns);
     const std::string arrow = std::string(static_cast<std::size_t>(std::max(filled - 1, 0)), '=') + '>';
     return fmt::format("[{:<{}}] ", arrow, kBarColumns);
+}
+
+/// "PGS" for FFmpeg's "hdmv_pgs_subtitle".
+std::string_view NameForUsers(std::string_view codec) {
+    static constexpr std::pair<std::string_view, std::string_view> kNames[] = {{"hdmv_pgs_subtitle", "PGS"},
+                                                                               {"dvd_subtitle", "DVD"},
+                                                                               {"dvb_subtitle", "DVB"},
+                                                                               {"dvb_teletext", "teletext"},
+                                                                               {"eia_608", "EIA-608"},
+                                                                               {"xsub", "DivX"},
+                                                                               {"subrip", "SRT"},
+                                                                               {"ass", "ASS"},
+                                                                               {"webvtt", "WebVTT"}};
+    for (const auto& [name, shown] : kNames)
+        if (name == codec)
+            return shown;
+    return codec;
 }
 
 } // namespace
@@ -65,7 +84,7 @@ void SparseReporter::Warn(const std::string& text) {
 
 void SparseReporter::LeftBehind(const NotCarried& report) {
     const std::string number = report.number ? fmt::format(" {}", *report.number) : std::string();
-    std::string details = report.codec;
+    std::string details(NameForUsers(report.codec));
     if (!report.language.empty())
         details += (details.empty() ? "" : ", ") + report.language;
     if (!details.empty())

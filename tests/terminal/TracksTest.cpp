@@ -100,4 +100,94 @@ TEST(Tracks, ClipsJoinToTheSample) {
     }
 }
 
+/// Six seconds with texts of which two overlap and one lies over 4 s.
+std::string WithTexts() {
+    const Folder folder;
+    WriteFile(folder / "words.srt", "1\n00:00:00,500 --> 00:00:01,500\nFirst\n\n"
+                                    "2\n00:00:01,200 --> 00:00:02,800\nMore <i>words</i>\n\n"
+                                    "3\n00:00:03,500 --> 00:00:04,600\nOver the cut\n");
+    return test_movies::Make(
+        "with_texts.mkv",
+        Join(CountedPictures(6), Args{"-i", folder / "words.srt", "-c:v", "mpeg4", "-c:s", "srt", "-map", "0",
+                                      "-map", "1", "-metadata:s:s:0", "language=fre"}));
+}
+
+/// The texts of a movie's first track of subtitles as FFmpeg reads them, from the begin of its pictures.
+std::string TextsOf(const std::string& path) {
+    const std::string cues =
+        program::Run({"ffmpeg", "-v", "error", "-i", path, "-map", "0:s:0", "-f", "srt", "-"}).out;
+    std::string text;
+    for (const char letter : cues)
+        text += letter == '\n' ? " " : letter == '\r' ? "" : std::string(1, letter);
+    return text;
+}
+
+TEST(Tracks, TextsComeInTheFormatsOwnFormAndAreCutWithTheMovie) {
+    const Folder folder;
+    const struct {
+        const char* name;
+        Args options;
+        const char* file;
+        const char* texts;
+    } cases[] = {
+        {"a.mkv",
+         {},
+         "a.mkv",
+         "1 00:00:00,500 --> 00:00:01,500 First  2 00:00:01,200 --> 00:00:02,800 More <i>words</i>  "
+         "3 00:00:03,500 --> 00:00:04,600 Over the cut  "},
+        {"a.webm",
+         {},
+         "a.webm",
+         "1 00:00:00,500 --> 00:00:01,500 First  2 00:00:01,200 --> 00:00:02,800 More <i>words</i>  "
+         "3 00:00:03,500 --> 00:00:04,600 Over the cut  "},
+        // One text at a time.
+        {"a.mp4",
+         {},
+         "a.mp4",
+         "1 00:00:00,500 --> 00:00:01,200 First  2 00:00:01,200 --> 00:00:01,500 First More <i>words</i>  "
+         "3 00:00:01,500 --> 00:00:02,800 More <i>words</i>  4 00:00:03,500 --> 00:00:04,600 Over the cut  "},
+        {"b.mp4",
+         {"--split", "4"},
+         "b_00.mp4",
+         "1 00:00:00,500 --> 00:00:01,200 First  2 00:00:01,200 --> 00:00:01,500 First More <i>words</i>  "
+         "3 00:00:01,500 --> 00:00:02,800 More <i>words</i>  4 00:00:03,500 --> 00:00:04,000 Over the cut  "},
+        {"b.mp4",
+         {"--split", "4", "--overwrite"},
+         "b_01.mp4",
+         "1 00:00:00,000 --> 00:00:00,600 Over the cut  "},
+        {"c.mkv",
+         {"--begin", "1", "--length", "3"},
+         "c.mkv",
+         "1 00:00:00,000 --> 00:00:00,500 First  2 00:00:00,200 --> 00:00:01,800 More <i>words</i>  "
+         "3 00:00:02,500 --> 00:00:03,000 Over the cut  "},
+    };
+    for (const auto& test : cases) {
+        SCOPED_TRACE(test.file);
+        const Result made =
+            Call(Join(Args{WithTexts(), folder / test.name, "--progress", "none"}, test.options));
+        ASSERT_EQ(made.code, 0) << made.err;
+        EXPECT_EQ(made.err, "");
+        EXPECT_EQ(TextsOf(folder / test.file), test.texts);
+        EXPECT_NE(program::Run(
+                      {"ffprobe", "-v", "error", "-show_entries", "stream_tags=language", folder / test.file})
+                      .out.find("language=fre"),
+                  std::string::npos);
+        const Result decoded =
+            program::Run({"ffmpeg", "-v", "error", "-i", folder / test.file, "-f", "null", "-"});
+        EXPECT_EQ(decoded.code, 0);
+        EXPECT_EQ(decoded.err, "");
+    }
+    const Result other = Call({WithTexts(), folder / "a.avi", "--progress", "none"});
+    EXPECT_EQ(other.err, "movieconv: not carried: subtitles 1 (SRT, fre): AVI cannot hold them, MKV can\n");
+}
+
+TEST(Tracks, CarriedOnceMoreTheyStayAsTheyAre) {
+    const Folder folder;
+    ASSERT_EQ(Call({WithTexts(), folder / "first.mp4", "-q"}).code, 0);
+    ASSERT_EQ(Call({folder / "first.mp4", folder / "second.mp4", "-q"}).code, 0);
+    ASSERT_EQ(Call({folder / "second.mp4", folder / "third.mkv", "-q"}).code, 0);
+    EXPECT_EQ(TextsOf(folder / "second.mp4"), TextsOf(folder / "first.mp4"));
+    EXPECT_EQ(TextsOf(folder / "third.mkv"), TextsOf(folder / "first.mp4"));
+}
+
 } // namespace

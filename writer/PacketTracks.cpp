@@ -1,0 +1,237 @@
+#include "writer/PacketTracks.h"
+
+#include "media/MediaRecords.h"
+#include "platform/LogRoute.h"
+#include "writer/CueRow.h"
+#include "writer/FileRecord.h"
+#include "writer/WriterFailure.h"
+
+#include <algorithm>
+#include <array>
+#include <cstring>
+#include <limits>
+#include <string>
+#include <utility>
+
+namespace writer {
+namespace {
+
+/// Of the times of cues. MP4's multiplexer compares them with those of other tracks without regard to units:
+/// no other may be finer.
+constexpr AVRational kCueUnit{1, 192000};
+constexpr AVRational kTick{1, kTicksPerSecond};
+constexpr int64_t kUnknownLength = 5 * kTicksPerSecond; // of a text that does not say how long it is shown
+
+const Carriage kAsUsual{};
+
+/// What both kinds have in common: they do their work on the stage's thread.
+class PacketTrack : public BesideTrack {
+public:
+    PacketTrack(const Track& track, AVRational unit)
+        : track_(track), unit_(unit), parameters_(avcodec_parameters_alloc()) {
+        if (!parameters_)
+            throw std::bad_alloc();
+    }
+
+    MuxedStream Stream() const override {
+        return {parameters_.get(), unit_, {0, 1}, {0, 1}, 0, &kAsUsual, &track_.label};
+    }
+    void Start(PacketTaker take, StageFailure /*failed*/) override { take_ = std::move(take); }
+    void Finish() override {}
+    void Cancel() override {}
+    void Join() override {}
+
+protected:
+    /// `packet` at its time in the file, in 100 ns units.
+    void HandOn(AVPacket& packet, int64_t begin, int64_t duration) {
+        packet.pts = packet.dts = av_rescale_q(begin, kTick, unit_);
+        packet.duration = av_rescale_q(begin + duration, kTick, unit_) - packet.pts;
+        packet.flags |= AV_PKT_FLAG_KEY;
+        take_(packet);
+    }
+
+    const Track& track_;
+    const AVRational unit_;
+    av::CodecParameters parameters_;
+
+private:
+    PacketTaker take_;
+};
+
+bool IsSound(const Track& track) {
+    return track.parameters->codec_type == AVMEDIA_TYPE_AUDIO;
+}
+
+/// Packets as they are.
+class CopiedPackets final : public PacketTrack {
+public:
+    explicit CopiedPackets(const Track& track)
+        : PacketTrack(track,
+                      IsSound(track) ? AVRational{1, std::max(track.parameters->sample_rate, 1)} : kCueUnit) {
+        av::CheckMemory(avcodec_parameters_copy(parameters_.get(), track.parameters.get()));
+    }
+
+    bool Take(const WriterTrackItem& item, int64_t time) override {
+        const bool ends = item.llDuration > 0;
+        const bool isBefore = ends && time + item.llDuration <= 0;
+        if (isBefore || IsEmptyText(*item.pPacket))
+            return true;
+        const av::Packet packet(av_packet_clone(item.pPacket));
+        if (!packet)
+            throw std::bad_alloc();
+        const int64_t begin = std::max<int64_t>(time, 0);
+        HandOn(*packet, begin, ends ? time + item.llDuration - begin : 0);
+        return true;
+    }
+
+private:
+    bool IsEmptyText(const AVPacket& packet) const {
+        constexpr int kLengthField = 2;
+        return parameters_->codec_id == AV_CODEC_ID_MOV_TEXT && packet.size <= kLengthField;
+    }
+};
+
+struct SubtitleFree {
+    void operator()(AVSubtitle* subtitle) const { avsubtitle_free(subtitle); }
+};
+
+av::CodecContext OpenCues(const AVCodec* codec, const AVCodecParameters* parameters,
+                          const AVCodecContext* header) {
+    av::CodecContext context(avcodec_alloc_context3(codec));
+    if (!context)
+        throw std::bad_alloc();
+    if (parameters != nullptr)
+        av::CheckMemory(avcodec_parameters_to_context(context.get(), parameters));
+    context->time_base = {1, 1000};
+    context->pkt_timebase = {1, 1000};
+    if (header != nullptr && header->subtitle_header != nullptr) {
+        context->subtitle_header = static_cast<uint8_t*>(
+            av_memdup(header->subtitle_header, static_cast<size_t>(header->subtitle_header_size) + 1));
+        if (context->subtitle_header == nullptr)
+            throw std::bad_alloc();
+        context->subtitle_header_size = header->subtitle_header_size;
+    }
+    const int result =
+        codec == nullptr ? AVERROR_ENCODER_NOT_FOUND : avcodec_open2(context.get(), codec, nullptr);
+    av::CheckMemory(result);
+    if (result < 0)
+        throw WriterFailure(kWriterErrorCodec,
+                            "The subtitles cannot be converted: " + av::ErrorText(result) + ".");
+    return context;
+}
+
+/// Subtitles of text in another form than they have.
+class ConvertedText final : public PacketTrack {
+public:
+    ConvertedText(const Track& track, AVCodecID target)
+        : PacketTrack(track, kCueUnit),
+          decoder_(
+              OpenCues(avcodec_find_decoder(track.parameters->codec_id), track.parameters.get(), nullptr)),
+          encoder_(OpenCues(avcodec_find_encoder(target), nullptr, decoder_.get())),
+          oneAtATime_(target == AV_CODEC_ID_MOV_TEXT),
+          packet_(av::NewPacket()),
+          row_([this](int64_t begin, int64_t end, const std::vector<std::string>& texts) {
+              Encode(begin, end, texts);
+          }) {
+        av::CheckMemory(avcodec_parameters_from_context(parameters_.get(), encoder_.get()));
+    }
+
+    bool Take(const WriterTrackItem& item, int64_t time) override {
+        const int64_t end = time + (item.llDuration > 0 ? item.llDuration : kUnknownLength);
+        const int64_t begin = std::max<int64_t>(time, 0);
+        if (end <= begin)
+            return true;
+        for (std::string& text : Decode(*item.pPacket)) {
+            if (oneAtATime_)
+                row_.Add(begin, end, std::move(text));
+            else
+                Encode(begin, end, {text});
+        }
+        return true;
+    }
+
+    void Reach(int64_t time) override { row_.Reach(time); }
+    void Finish() override { row_.Finish(); }
+
+private:
+    std::vector<std::string> Decode(const AVPacket& source) {
+        const av::Packet packet(av_packet_clone(&source));
+        if (!packet)
+            throw std::bad_alloc();
+        packet->pts = packet->dts = 0;
+        packet->duration = 1;
+        AVSubtitle decoded{};
+        int got = 0;
+        const int result = avcodec_decode_subtitle2(decoder_.get(), &decoded, &got, packet.get());
+        const std::unique_ptr<AVSubtitle, SubtitleFree> owner(&decoded);
+        av::CheckMemory(result);
+        std::vector<std::string> texts;
+        for (unsigned i = 0; result >= 0 && got != 0 && i < decoded.num_rects; ++i)
+            if (decoded.rects[i]->ass != nullptr)
+                texts.emplace_back(decoded.rects[i]->ass);
+        if (result < 0)
+            Drop("read", result);
+        return texts;
+    }
+
+    /// Several texts come below each other in the place and style of the first.
+    void Encode(int64_t begin, int64_t end, const std::vector<std::string>& texts) {
+        std::string line = texts.front();
+        for (size_t i = 1; i < texts.size(); ++i)
+            line += "\\N" + WordsOf(texts[i]);
+        if (WordsOf(line).empty())
+            return;
+        AVSubtitleRect rect{};
+        rect.type = SUBTITLE_ASS;
+        rect.ass = line.data();
+        AVSubtitleRect* rects = &rect;
+        AVSubtitle subtitle{};
+        subtitle.num_rects = 1;
+        subtitle.rects = &rects;
+        subtitle.end_display_time = static_cast<uint32_t>((end - begin) / (kTicksPerSecond / 1000));
+        std::vector<uint8_t> coded(kLeastRoom + line.size() * 4);
+        const int size =
+            avcodec_encode_subtitle(encoder_.get(), coded.data(), static_cast<int>(coded.size()), &subtitle);
+        av::CheckMemory(size);
+        if (size <= 0) {
+            Drop("written", size);
+            return;
+        }
+        av::CheckMemory(av_new_packet(packet_.get(), size));
+        std::copy_n(coded.begin(), size, packet_->data);
+        HandOn(*packet_, begin, end - begin);
+        av_packet_unref(packet_.get());
+    }
+
+    /// What is behind the commas that part the fields of an event.
+    static std::string WordsOf(const std::string& event) {
+        constexpr int kFieldsBefore = 8;
+        size_t at = 0;
+        for (int i = 0; i < kFieldsBefore && at != std::string::npos; ++i)
+            at = event.find(',', at == 0 && i == 0 ? 0 : at + 1);
+        return at == std::string::npos ? std::string() : event.substr(at + 1);
+    }
+
+    static void Drop(const char* what, int error) {
+        WriteLog(kLogWarning, "A subtitle could not be %s: %s.", what, av::ErrorText(error).c_str());
+    }
+
+    static constexpr size_t kLeastRoom = 65536;
+
+    av::CodecContext decoder_;
+    av::CodecContext encoder_;
+    const bool oneAtATime_;
+    av::Packet packet_;
+    CueRow row_;
+};
+
+} // namespace
+
+std::unique_ptr<BesideTrack> MakePacketTrack(const Track& track, const Container& container) {
+    const AVCodecID target = PacketForm(container, track.parameters->codec_id);
+    if (target == track.parameters->codec_id)
+        return std::make_unique<CopiedPackets>(track);
+    return std::make_unique<ConvertedText>(track, target);
+}
+
+} // namespace writer
