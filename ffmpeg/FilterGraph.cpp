@@ -19,13 +19,14 @@ void FilterGraph::GraphFree::operator()(AVFilterGraph* graph) const {
     Filters().avfilter_graph_free(&graph);
 }
 
-FilterGraph::FilterGraph(const AVFrame& form, const std::string& chain)
+FilterGraph::FilterGraph(const AVFrame& form, const std::string& chain, int threads)
     : graph_(Filters().avfilter_graph_alloc()),
       width_(form.width),
       height_(form.height),
       format_(form.format) {
     if (!graph_)
         throw std::bad_alloc();
+    graph_->nb_threads = threads;
     const std::string description = "video_size=" + std::to_string(width_) + "x" + std::to_string(height_) +
                                     ":pix_fmt=" + std::to_string(format_) +
                                     ":time_base=1/25:pixel_aspect=1/1";

@@ -32,7 +32,7 @@ bool LooksTheSame(const AVFrame& one, const AVFrame& other) {
 av::Frame PaletteMaker::Convert(av::Frame picture) {
     if (!last_ || !LooksTheSame(*last_, *picture)) {
         try {
-            av::FilterGraph graph(*picture, kChain);
+            av::FilterGraph graph(*picture, kChain, 1);
             last_ = av::NewFrame();
             av::CheckMemory(av_frame_ref(last_.get(), picture.get()));
             picture->pts = 0;
