@@ -1,15 +1,20 @@
 #include "host/convert/CarryOver.h"
 
 #include "host/convert/CodecPlan.h"
+#include "host/source/Languages.h"
+#include "host/source/SourceError.h"
+#include "host/source/StreamChoice.h"
 #include "media/FourCC.h"
 #include "media/MediaRecords.h"
 #include "writer/WriterStatus.h"
 
 #include <algorithm>
+#include <cctype>
 #include <cmath>
 #include <cstddef>
 #include <fmt/format.h>
 #include <new>
+#include <optional>
 #include <string>
 #include <string_view>
 #include <utility>
@@ -37,9 +42,10 @@ int Dispositions(const StreamFlags& flags) {
            (flags.visualImpaired ? AV_DISPOSITION_VISUAL_IMPAIRED : 0);
 }
 
-void LabelTrack(const StreamInfo& stream, uint32_t set, int track) {
+void LabelTrack(const StreamInfo& stream, const Request& request, uint32_t set, int track) {
     MWSetTrackTag(set, track, "language", stream.language.c_str());
-    MWSetTrackTag(set, track, "title", stream.title.c_str());
+    if (!request.noMetadata)
+        MWSetTrackTag(set, track, "title", stream.title.c_str());
     MWSetTrackFlags(set, track, Dispositions(stream.flags));
 }
 
@@ -47,13 +53,28 @@ const StreamInfo& StreamAt(const SourceInfo& source, int index) {
     return source.streams[static_cast<std::size_t>(index)];
 }
 
-void CarryTexts(const SourceInfo& source, uint32_t set) {
-    for (const Tag& tag : source.tags)
+bool AreAlike(std::string_view one, std::string_view other) {
+    return std::equal(one.begin(), one.end(), other.begin(), other.end(),
+                      [](unsigned char a, unsigned char b) { return std::tolower(a) == std::tolower(b); });
+}
+
+bool IsAmong(const std::vector<int>& list, int number) {
+    return std::count(list.begin(), list.end(), number) > 0;
+}
+
+void CarryTexts(const SourceInfo& source, const Request& request, uint32_t set) {
+    for (const Tag& tag : source.tags) {
+        const bool replaced = std::any_of(request.metadata.begin(), request.metadata.end(),
+                                          [&](const Tag& wish) { return AreAlike(wish.key, tag.key); });
+        if (!request.noMetadata && !replaced)
+            MWSetTag(set, tag.key.c_str(), tag.value.c_str());
+    }
+    for (const Tag& tag : request.metadata)
         MWSetTag(set, tag.key.c_str(), tag.value.c_str());
     if (source.pictures)
-        LabelTrack(StreamAt(source, source.pictures->index), set, kWriterTrackPictures);
+        LabelTrack(StreamAt(source, source.pictures->index), request, set, kWriterTrackPictures);
     if (source.sound)
-        LabelTrack(StreamAt(source, source.sound->index), set, kWriterTrackSound);
+        LabelTrack(StreamAt(source, source.sound->index), request, set, kWriterTrackSound);
 }
 
 int TakeNext(void* context, int64_t until, int closing, WriterTrackItem* item) {
@@ -61,6 +82,15 @@ int TakeNext(void* context, int64_t until, int closing, WriterTrackItem* item) {
     const bool any = static_cast<BesideTrack*>(context)->Next(until, closing != 0, found);
     *item = {found.sound, found.packet, found.time, found.duration};
     return any ? 1 : 0;
+}
+
+/// Why subtitles stay behind; empty when they do not.
+std::string WhySubtitlesStay(const StreamInfo& stream, const FileFormatInfo& format) {
+    constexpr uint32_t kMatroska = FourCC("MKV ");
+    if (MWCarriesPackets(format.fccFormat, stream.codec.c_str()) != 0)
+        return {};
+    const bool matroskaCan = MWCarriesPackets(kMatroska, stream.codec.c_str()) != 0;
+    return fmt::format("{} cannot hold them{}", NameOf(format), matroskaCan ? ", MKV can" : "");
 }
 
 /// Adds the tracks that are read beside what the engine converts.
@@ -81,6 +111,22 @@ public:
         Add(track, movie_.ReadSoundBeside(stream.index), stream);
     }
 
+    /// Returns why not, or nothing.
+    std::optional<NotCarried> AddFile(const SubtitleFileWish& wish, const std::string& charset) {
+        const AVStream* described = nullptr;
+        BesidePackets& source = ReadFile(wish, charset, described);
+        StreamInfo stream;
+        stream.kind = StreamKind::kSubtitles;
+        stream.codec = avcodec_get_name(described->codecpar->codec_id);
+        stream.language = ThreeLetters(wish.language);
+        if (std::string reason = WhySubtitlesStay(stream, format_); !reason.empty())
+            return NotCarried{"subtitles", std::nullopt, stream.codec, stream.language, std::move(reason)};
+        WriterTrack track{};
+        track.pParameters = described->codecpar;
+        Add(track, source, stream);
+        return std::nullopt;
+    }
+
     void AddPackets(const StreamInfo& stream) {
         WriterTrack track{};
         track.pParameters = movie_.StreamOf(stream.index).codecpar;
@@ -88,12 +134,21 @@ public:
     }
 
 private:
+    BesidePackets& ReadFile(const SubtitleFileWish& wish, const std::string& charset,
+                            const AVStream*& stream) {
+        try {
+            return movie_.ReadSubtitleFile(wish.path, charset, stream);
+        } catch (const SourceError& error) {
+            throw Failure(Category::kRequest, error.what());
+        }
+    }
+
     void Add(WriterTrack& track, BesideTrack& source, const StreamInfo& stream) {
         track.pfnNext = TakeNext;
         track.pContext = &source;
         if (MWAddTrack(set_, &track) == 0)
             throw std::bad_alloc();
-        LabelTrack(stream, set_, kWriterTrackFurther + count_++);
+        LabelTrack(stream, request_, set_, kWriterTrackFurther + count_++);
     }
 
     Movie& movie_;
@@ -140,15 +195,6 @@ bool CarryFile(const Movie& movie, const StreamInfo& stream, uint32_t set) {
 }
 
 /// Empty when the stream was carried, or is of a kind of which the source itself tells.
-/// Why subtitles stay behind; empty when they do not.
-std::string WhySubtitlesStay(const StreamInfo& stream, const FileFormatInfo& format) {
-    constexpr uint32_t kMatroska = FourCC("MKV ");
-    if (MWCarriesPackets(format.fccFormat, stream.codec.c_str()) != 0)
-        return {};
-    const bool matroskaCan = MWCarriesPackets(kMatroska, stream.codec.c_str()) != 0;
-    return fmt::format("{} cannot hold them{}", NameOf(format), matroskaCan ? ", MKV can" : "");
-}
-
 std::string ReasonFor(const Movie& movie, const StreamInfo& stream, const FileFormatInfo& format,
                       uint32_t set, bool& hasCover) {
     const uint32_t traits = MWGetFormatTraits(format.fccFormat);
@@ -184,11 +230,13 @@ std::string ReasonFor(const Movie& movie, const StreamInfo& stream, const FileFo
 
 } // namespace
 
-std::vector<int> FurtherSound(const SourceInfo& source, const FileFormatInfo& format) {
+std::vector<int> FurtherSound(const SourceInfo& source, const Request& request,
+                              const FileFormatInfo& format) {
     std::vector<int> further;
+    const std::vector<int> wanted = WantedTracks(source.streams, StreamKind::kSound, request.audioTracks);
     for (const StreamInfo& stream : source.streams)
-        if (source.sound && stream.kind == StreamKind::kSound && stream.index != source.sound->index &&
-            WhySoundStays(source, stream, format).empty())
+        if (source.sound && IsAmong(wanted, stream.index) && stream.kind == StreamKind::kSound &&
+            stream.index != source.sound->index && WhySoundStays(source, stream, format).empty())
             further.push_back(stream.index);
     return further;
 }
@@ -197,8 +245,8 @@ std::vector<NotCarried> CarryOver(Movie& movie, const Request& request, const Fi
                                   uint32_t writerSet) {
     const SourceInfo& source = movie.Info();
     std::vector<NotCarried> left;
-    CarryTexts(source, writerSet);
-    if (!source.chapters.empty()) {
+    CarryTexts(source, request, writerSet);
+    if (!source.chapters.empty() && !request.noChapters) {
         const bool can = (MWGetFormatTraits(format.fccFormat) & kWriterFormatChapters) != 0;
         const int wrong = CarryChapters(source, writerSet);
         if (!can)
@@ -209,13 +257,25 @@ std::vector<NotCarried> CarryOver(Movie& movie, const Request& request, const Fi
                 {"chapters", std::nullopt, {}, {}, fmt::format("{} of them have no length", wrong)});
     }
     FurtherTracks tracks(movie, request, format, writerSet);
-    for (const int stream : FurtherSound(source, format))
+    for (const int stream : FurtherSound(source, request, format))
         tracks.AddSound(StreamAt(source, stream));
-    for (const StreamInfo& stream : source.streams)
-        if (stream.kind == StreamKind::kSubtitles && WhySubtitlesStay(stream, format).empty())
-            tracks.AddPackets(stream);
+    const std::vector<int> wantedSound =
+        WantedTracks(source.streams, StreamKind::kSound, request.audioTracks);
+    const std::vector<int> wantedTexts =
+        WantedTracks(source.streams, StreamKind::kSubtitles, request.subtitles);
+    for (const int stream : wantedTexts)
+        if (WhySubtitlesStay(StreamAt(source, stream), format).empty())
+            tracks.AddPackets(StreamAt(source, stream));
+    for (const SubtitleFileWish& wish : request.subtitleFiles)
+        if (std::optional<NotCarried> stays = tracks.AddFile(wish, request.subtitleCharset))
+            left.push_back(std::move(*stays));
     bool hasCover = false;
     for (const StreamInfo& stream : source.streams) {
+        const bool isUnwanted =
+            (stream.kind == StreamKind::kSound && !IsAmong(wantedSound, stream.index)) ||
+            (stream.kind == StreamKind::kSubtitles && !IsAmong(wantedTexts, stream.index));
+        if (isUnwanted)
+            continue;
         std::string reason = ReasonFor(movie, stream, format, writerSet, hasCover);
         if (!reason.empty())
             left.push_back({std::string(KindName(stream.kind)), stream.index, stream.codec, stream.language,

@@ -13,7 +13,7 @@
 namespace movieconv {
 
 /// The streams of sound that go into the output beside the one that the engine converts.
-std::vector<int> FurtherSound(const SourceInfo& source, const FileFormatInfo& format);
+std::vector<int> FurtherSound(const SourceInfo& source, const Request& request, const FileFormatInfo& format);
 
 /// Gives the writer's set what the format can carry of the movie: texts, chapters, cover, attachments,
 /// further tracks, which are read from the movie while it is converted. Returns what stays behind.

@@ -5,11 +5,13 @@
 #include "host/convert/Preferences.h"
 #include "host/source/Crop.h"
 #include "host/source/Deinterlace.h"
+#include "host/source/SourceInfo.h"
 
 #include <chrono>
 #include <cstdint>
 #include <optional>
 #include <string>
+#include <vector>
 
 namespace movieconv {
 
@@ -32,6 +34,11 @@ struct PieceCut {
     bool last = false;           ///< No pictures follow.
     std::optional<int64_t> tick; ///< By the media writer's plan; nothing before the first picture shown.
     bool fromStart = false;      ///< The source can only be read from its start.
+};
+
+struct SubtitleFileWish {
+    std::string path;
+    std::string language; ///< Of two or three letters; empty when it is not told.
 };
 
 /// Names are bytes as the system has them. What is not given is left to the preferences, then to the engine's
@@ -64,6 +71,16 @@ struct Request {
     std::optional<int> depth;
     /// Bytes that the output may have at most: chooses the rates, and where they are low a picture size.
     std::optional<int64_t> maxSize;
+    /// The sound and the subtitles of the source that come into the output: numbers as SourceInfo has them,
+    /// or languages. Nothing: all, as far as the format holds them; an empty list: none, for sound as
+    /// noAudio.
+    TrackList audioTracks;
+    TrackList subtitles;
+    std::vector<SubtitleFileWish> subtitleFiles; ///< Further subtitles of text.
+    std::string subtitleCharset;                 ///< Of these files; empty: each is looked at.
+    bool noChapters = false;
+    bool noMetadata = false;   ///< None of the source's texts, but the languages of tracks.
+    std::vector<Tag> metadata; ///< Texts that replace the source's; an empty value takes one away.
     bool noVideo = false;
     bool noAudio = false;
     bool playlists = false; ///< The input may be a playlist, which names movies in its folder and below.

@@ -12,7 +12,10 @@ namespace {
 
 SourceChoice ChoiceOf(const Request& request) {
     return {.pictures = !request.noVideo,
-            .sound = !request.noAudio && !(request.piece && request.piece->pictures),
+            .sound = !request.noAudio && !(request.piece && request.piece->pictures) &&
+                     !(request.audioTracks && request.audioTracks->empty()),
+            .soundTracks = request.audioTracks,
+            .subtitles = request.subtitles,
             .deinterlace = request.deinterlace,
             .stampsOnly = request.piece && !request.piece->pictures,
             .fromStart = request.piece && request.piece->fromStart,
@@ -47,6 +50,8 @@ auto Opened(Open open) {
         return open();
     } catch (const PlaylistError& error) {
         throw Failure(Category::kSource, error.what(), Reason::kPlaylist);
+    } catch (const TrackError& error) {
+        throw Failure(Category::kRequest, error.what());
     } catch (const CropError& error) {
         throw Failure(Category::kRequest, error.what());
     } catch (const SourceError& error) {

@@ -57,6 +57,22 @@ BesidePackets& Movie::ReadPacketsBeside(int stream) {
     return made;
 }
 
+BesidePackets& Movie::ReadSubtitleFile(const std::string& path, const std::string& charset,
+                                       const AVStream*& stream) {
+    subtitleFiles_.push_back(std::make_unique<SubtitleFile>(path, charset));
+    SubtitleFile& file = *subtitleFiles_.back();
+    stream = &file.Stream();
+    auto track =
+        std::make_unique<BesidePackets>([&file](int64_t, bool) { return file.Take(); },
+                                        [](int64_t stamp, AVRational timeBase) {
+                                            return av_rescale_q(stamp, timeBase, {1, kTicksPerSecond});
+                                        },
+                                        stream->time_base, bounds_, failures_);
+    BesidePackets& made = *track;
+    beside_.push_back(std::move(track));
+    return made;
+}
+
 /// Of all subtitles, read once.
 std::map<int, std::vector<av::Packet>>& Movie::EarlierCues() {
     if (std::exchange(earlierCuesRead_, true) || !source_.Reader().IsSeekable())

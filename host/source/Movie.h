@@ -9,6 +9,7 @@
 #include "host/source/PictureStamps.h"
 #include "host/source/SoundDecoder.h"
 #include "host/source/Source.h"
+#include "host/source/SubtitleFile.h"
 
 #include <map>
 #include <memory>
@@ -54,6 +55,10 @@ public:
     /// lives as long as the movie. Once for a stream, only before the conversion. Throws SourceError.
     BesideSound& ReadSoundBeside(int stream);
     BesidePackets& ReadPacketsBeside(int stream);
+
+    /// Subtitles of a file of their own, whose times are the movie's. `stream` is set to their description.
+    BesidePackets& ReadSubtitleFile(const std::string& path, const std::string& charset,
+                                    const AVStream*& stream);
 
     /// A stream of Info() as the container describes it. Valid until the conversion.
     const AVStream& StreamOf(int stream) const { return *source_.Reader().Context()->streams[stream]; }
@@ -102,6 +107,7 @@ private:
     std::map<int, std::vector<av::Packet>> earlierCues_; // by stream, from before the begin
     bool earlierCuesRead_ = false;
     std::vector<int> besideStreams_;
+    std::vector<std::unique_ptr<SubtitleFile>> subtitleFiles_;
     std::vector<std::unique_ptr<BesideTrack>> beside_;
 };
 

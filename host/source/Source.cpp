@@ -33,6 +33,7 @@ Source::Source(const std::string& path, const SourceChoice& choice,
     info_.chapters = DescribeChapters(context, reader_.Start());
     info_.tags = DescribeTags(context.metadata);
     const ChosenStreams chosen = ChooseStreams(info_.streams, choice);
+    WantedTracks(info_.streams, StreamKind::kSubtitles, choice.subtitles); // throws
     std::vector<int> selected;
     if (chosen.pictures >= 0) {
         selected.push_back(chosen.pictures);

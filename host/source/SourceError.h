@@ -19,6 +19,12 @@ public:
     using SourceError::SourceError;
 };
 
+/// There is no stream such as is asked for. The text says which there are.
+class TrackError : public SourceError {
+public:
+    using SourceError::SourceError;
+};
+
 /// What is to be cut off its pictures leaves too little of them.
 class CropError : public SourceError {
 public:

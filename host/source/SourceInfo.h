@@ -147,9 +147,14 @@ struct SourceInfo {
     Promise promise; ///< Of these two.
 };
 
+/// Which streams of a kind are wanted: by their numbers, or by their languages; nothing: all of them.
+using TrackList = std::optional<std::vector<std::string>>;
+
 struct SourceChoice {
     bool pictures = true; ///< Look for pictures at all.
     bool sound = true;    ///< Look for sound at all.
+    TrackList soundTracks{};
+    TrackList subtitles{};
     Deinterlace deinterlace = Deinterlace::kFlagged;
     bool deep = false;       ///< Pictures of more than 8 bits are handed out with 10; otherwise with 8.
     Crop crop{};             ///< Cut off the pictures; odd numbers are lowered by one.

@@ -1,6 +1,11 @@
 #include "host/source/StreamChoice.h"
 
+#include "host/source/Languages.h"
+#include "host/source/SourceError.h"
+
 #include <algorithm>
+#include <fmt/format.h>
+#include <string>
 #include <tuple>
 
 namespace movieconv {
@@ -40,7 +45,44 @@ int Best(const std::vector<StreamInfo>& streams, Fits fits, Rank rank) {
     return best != nullptr ? best->index : -1;
 }
 
+std::string ListOf(const std::vector<StreamInfo>& streams, StreamKind kind) {
+    std::string list;
+    for (const StreamInfo& stream : streams)
+        if (stream.kind == kind)
+            list += fmt::format("{}{}{}", list.empty() ? "" : ", ", stream.index,
+                                stream.language.empty() ? "" : " (" + stream.language + ")");
+    return list.empty() ? "none" : list;
+}
+
+bool IsNumber(const std::string& text) {
+    return !text.empty() &&
+           std::all_of(text.begin(), text.end(), [](char letter) { return letter >= '0' && letter <= '9'; });
+}
+
 } // namespace
+
+std::vector<int> WantedTracks(const std::vector<StreamInfo>& streams, StreamKind kind,
+                              const TrackList& wanted) {
+    std::vector<std::string> missing = wanted.value_or(std::vector<std::string>());
+    std::vector<int> found;
+    for (const StreamInfo& stream : streams) {
+        const auto isMeant = [&](const std::string& name) {
+            return IsNumber(name)
+                       ? name == std::to_string(stream.index)
+                       : !stream.language.empty() && ThreeLetters(name) == ThreeLetters(stream.language);
+        };
+        if (stream.kind != kind || (wanted && std::none_of(wanted->begin(), wanted->end(), isMeant)))
+            continue;
+        found.push_back(stream.index);
+        missing.erase(std::remove_if(missing.begin(), missing.end(), isMeant), missing.end());
+    }
+    if (!missing.empty())
+        throw TrackError(fmt::format("there {} no {} \"{}\"; there {}: {}",
+                                     kind == StreamKind::kSound ? "is" : "are",
+                                     kind == StreamKind::kSound ? "sound" : "subtitles", missing.front(),
+                                     kind == StreamKind::kSound ? "is" : "are", ListOf(streams, kind)));
+    return found;
+}
 
 ChosenStreams ChooseStreams(const std::vector<StreamInfo>& streams, const SourceChoice& choice) {
     ChosenStreams chosen;
@@ -50,8 +92,12 @@ ChosenStreams ChooseStreams(const std::vector<StreamInfo>& streams, const Source
                                           ? streams[static_cast<std::size_t>(chosen.pictures)].programs
                                           : std::vector<int>();
     if (choice.sound) {
+        const std::vector<int> wanted = WantedTracks(streams, StreamKind::kSound, choice.soundTracks);
+        const auto fits = [&](const StreamInfo& stream) {
+            return IsSound(stream) && std::count(wanted.begin(), wanted.end(), stream.index) > 0;
+        };
         chosen.sound =
-            Best(streams, IsSound, [&](const StreamInfo& stream) { return SoundRank(stream, programs); });
+            Best(streams, fits, [&](const StreamInfo& stream) { return SoundRank(stream, programs); });
     }
     return chosen;
 }

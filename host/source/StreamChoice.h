@@ -14,6 +14,11 @@ struct ChosenStreams {
     int sound = -1;
 };
 
+/// The numbers of the streams of that kind that are wanted. Throws TrackError when one that is asked for is
+/// not there.
+std::vector<int> WantedTracks(const std::vector<StreamInfo>& streams, StreamKind kind,
+                              const TrackList& wanted);
+
 /// The pictures are those marked as default, of several the largest, of several the first. The sound belongs
 /// to the same broadcast programme, is no commentary and not made for people who see or hear little, if there
 /// is another; then as for pictures, with channels for size. Only what can be decoded.

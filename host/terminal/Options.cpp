@@ -9,7 +9,10 @@
 #include "media/Limits.h"
 
 #include <CLI/CLI.hpp>
+#include <algorithm>
+#include <cctype>
 #include <charconv>
+#include <cstddef>
 #include <cstdio>
 #include <cstdlib>
 #include <fmt/format.h>
@@ -175,6 +178,76 @@ void AddSound(CLI::App& app, Options& options) {
         ->group(group);
     AddRate(app, "--audio-max-rate", options.request.audioMaxRate, "128k",
             "Upper bit rate: the rate becomes a target")
+        ->group(group);
+}
+
+/// "all", "none", or what stands between commas.
+TrackList ParseTracks(const std::string& text) {
+    if (text == "all")
+        return std::nullopt;
+    TrackList list(std::in_place);
+    for (std::size_t at = 0; text != "none" && at <= text.size();) {
+        const std::size_t end = std::min(text.find(',', at), text.size());
+        if (end > at)
+            list->push_back(text.substr(at, end - at));
+        at = end + 1;
+    }
+    return list;
+}
+
+/// FILE or FILE:LANG, where a language has two or three letters and perhaps a region.
+SubtitleFileWish ParseSubtitleFile(const std::string& text) {
+    const std::size_t colon = text.rfind(':');
+    const std::string language = colon == std::string::npos ? "" : text.substr(colon + 1);
+    const std::string code = language.substr(0, language.find('-'));
+    const bool isCode =
+        (code.size() == 2 || code.size() == 3) &&
+        std::all_of(code.begin(), code.end(), [](unsigned char letter) { return std::isalpha(letter) != 0; });
+    return isCode ? SubtitleFileWish{text.substr(0, colon), language} : SubtitleFileWish{text, ""};
+}
+
+void AddCarried(CLI::App& app, Options& options) {
+    const std::string group = "Tracks and texts";
+    Request& request = options.request;
+    const auto addList = [&](const std::string& name, TrackList& list, const std::string& help) {
+        app.add_option_function<std::string>(
+               name, [&list](const std::string& text) { list = ParseTracks(text); }, help)
+            ->type_name("all|none|LIST")
+            ->group(group);
+    };
+    addList("--audio-tracks", request.audioTracks,
+            "Sound to convert, by numbers as --info shows them or\nby languages, between commas");
+    addList("--subtitles", request.subtitles, "Subtitles to carry, likewise");
+    app.add_option_function<std::vector<std::string>>(
+           "--subtitle-file",
+           [&request](const std::vector<std::string>& files) {
+               for (const std::string& file : files)
+                   request.subtitleFiles.push_back(ParseSubtitleFile(file));
+           },
+           "Add the subtitles of a file; may be repeated")
+        ->type_name("FILE[:LANG]")
+        ->take_all()
+        ->group(group);
+    app.add_option("--subtitle-charset", request.subtitleCharset,
+                   "Character set of these files, where it is not UTF-8,\nUTF-16 or Windows-1252")
+        ->type_name("NAME")
+        ->group(group);
+    app.add_flag("--no-chapters", request.noChapters, "Leave chapters out")->group(group);
+    app.add_flag("--no-metadata", request.noMetadata, "Leave the source's texts out, such as title and date")
+        ->group(group);
+    app.add_option_function<std::vector<std::string>>(
+           "--metadata",
+           [&request](const std::vector<std::string>& texts) {
+               for (const std::string& text : texts) {
+                   const std::size_t equals = text.find('=');
+                   if (equals == std::string::npos || equals == 0)
+                       throw CLI::ValidationError("--metadata", fmt::format("\"{}\" is not KEY=VALUE", text));
+                   request.metadata.push_back({text.substr(0, equals), text.substr(equals + 1)});
+               }
+           },
+           "Write a text, as title=Holidays, or with no value\nleave one out; may be repeated")
+        ->type_name("KEY=VALUE")
+        ->take_all()
         ->group(group);
 }
 
@@ -364,7 +437,8 @@ void RequireSense(const Options& options) {
     if (NeedsOutput(options.task) && !options.into && options.request.output.empty())
         throw Failure(Category::kRequest, "OUTPUT is missing; try \"movieconv --help\"");
     RequirePieces(options);
-    if (options.request.noVideo && options.request.noAudio)
+    const TrackList& sound = options.request.audioTracks;
+    if (options.request.noVideo && (options.request.noAudio || (sound && sound->empty())))
         throw Failure(Category::kRequest, "--no-video and --no-audio together leave nothing to convert");
     if (options.request.maxSize && (options.request.quality || options.request.videoRate ||
                                     options.request.audioRate || options.request.split))
@@ -426,6 +500,7 @@ std::optional<Options> ParseOptions(int argc, char** argv) {
     AddSound(app, options);
     AddMany(app, options);
     AddPieces(app, options);
+    AddCarried(app, options);
     AddOutput(app, options);
     AddReports(app, options);
     try {

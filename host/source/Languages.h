@@ -1,0 +1,16 @@
+// Names of languages, which containers and people write in several ways.
+#ifndef MOVIECONV_HOST_SOURCE_LANGUAGES_H
+#define MOVIECONV_HOST_SOURCE_LANGUAGES_H
+
+#include <string>
+#include <string_view>
+
+namespace movieconv {
+
+/// The three letters of ISO 639-2 (those made from the English name, where there are two) for a code of two
+/// or three letters, of which a region may follow behind a dash; other texts in small letters as they are.
+std::string ThreeLetters(std::string_view code);
+
+} // namespace movieconv
+
+#endif
