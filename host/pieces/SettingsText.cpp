@@ -33,6 +33,10 @@ Json ToJson(const Value& value) {
         return Json::array({value.width, value.height});
     else if constexpr (std::is_same_v<Value, Crop>)
         return Json::array({value.top, value.bottom, value.left, value.right});
+    else if constexpr (std::is_same_v<Value, Tag>)
+        return Json::array({value.key, value.value});
+    else if constexpr (std::is_same_v<Value, SubtitleFileWish>)
+        return Json::array({value.path, value.language});
     else
         return value;
 }
@@ -75,6 +79,10 @@ void FromJson(const Json& json, Value& value) {
         value.bottom = json.at(1).get<int>();
         value.left = json.at(2).get<int>();
         value.right = json.at(3).get<int>();
+    } else if constexpr (std::is_same_v<Value, Tag>) {
+        value = {json.at(0).get<std::string>(), json.at(1).get<std::string>()};
+    } else if constexpr (std::is_same_v<Value, SubtitleFileWish>) {
+        value = {json.at(0).get<std::string>(), json.at(1).get<std::string>()};
     } else if constexpr (std::is_same_v<Value, bool>) {
         value = json.get<bool>();
     } else if constexpr (std::is_integral_v<Value>) {
@@ -209,6 +217,13 @@ void Asked(Archive& archive, Fields& request) {
     archive("hdr", request.hdr);
     archive("depth", request.depth);
     archive("noAudio", request.noAudio);
+    archive("audioTracks", request.audioTracks);
+    archive("subtitles", request.subtitles);
+    archive("subtitleFiles", request.subtitleFiles);
+    archive("subtitleCharset", request.subtitleCharset);
+    archive("noChapters", request.noChapters);
+    archive("noMetadata", request.noMetadata);
+    archive("metadata", request.metadata);
     archive("begin", request.begin);
     archive("length", request.length);
 }

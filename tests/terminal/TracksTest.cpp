@@ -190,4 +190,85 @@ TEST(Tracks, CarriedOnceMoreTheyStayAsTheyAre) {
     EXPECT_EQ(TextsOf(folder / "third.mkv"), TextsOf(folder / "first.mp4"));
 }
 
+TEST(Tracks, AreChosenByNumberOrLanguage) {
+    const Folder folder;
+    const auto sounds = [&](const Args& options) {
+        const Result made =
+            Call(Join(Args{TwoSounds(), folder / "out.mkv", "--length", "0.5", "-y", "-q"}, options));
+        EXPECT_EQ(made.code, 0) << made.err;
+        std::string languages;
+        const std::string read =
+            program::Run({"ffprobe", "-v", "error", "-select_streams", "a", "-show_entries",
+                          "stream_tags=language", "-of", "csv=p=0", folder / "out.mkv"})
+                .out;
+        for (const char letter : read)
+            languages += letter == '\n' ? ' ' : letter;
+        return languages;
+    };
+    EXPECT_EQ(sounds({}), "ger eng ");
+    EXPECT_EQ(sounds({"--audio-tracks", "2"}), "eng ");
+    EXPECT_EQ(sounds({"--audio-tracks", "deu"}), "ger ");
+    EXPECT_EQ(sounds({"--audio-tracks", "en,1"}), "ger eng ");
+    EXPECT_EQ(sounds({"--audio-tracks", "none"}), "");
+    const Result none = Call({TwoSounds(), folder / "no.mkv", "--audio-tracks", "fr"});
+    EXPECT_EQ(none.code, 2);
+    EXPECT_NE(none.err.find("there is no sound \"fr\"; there is: 1 (ger), 2 (eng)"), std::string::npos)
+        << none.err;
+    EXPECT_EQ(Call({WithTexts(), folder / "no.mkv", "--subtitles", "0"}).code, 2);
+    ASSERT_EQ(Call({WithTexts(), folder / "no.mkv", "--subtitles", "none", "-q"}).code, 0);
+    EXPECT_EQ(TextsOf(folder / "no.mkv"), "");
+}
+
+TEST(Tracks, TextsComeFromFilesInAnyCharacterSet) {
+    const Folder folder;
+    const std::string cue = "1\n00:00:00,500 --> 00:00:01,000\n";
+    WriteFile(folder / "utf8.srt", cue + "Gr\xC3\xBC\xC3\x9F"
+                                         "e\n");
+    WriteFile(folder / "western.srt", cue + "Gr\xFC\xDF"
+                                            "e\n");
+    WriteFile(folder / "greek.srt", cue + "\xE1\n"); // ISO 8859-7
+    WriteFile(folder / "none.srt", "\x01\x02\x03");
+    const auto texts = [&](const Args& options) {
+        const Result made = Call(Join(
+            Args{TwoSounds(), folder / "out.mp4", "--length", "2", "-y", "--progress", "none"}, options));
+        EXPECT_EQ(made.code, 0) << made.err;
+        return TextsOf(folder / "out.mp4");
+    };
+    const std::string expected = "1 00:00:00,500 --> 00:00:01,000 Gr\xC3\xBC\xC3\x9F"
+                                 "e  ";
+    EXPECT_EQ(texts({"--subtitle-file", folder / "utf8.srt"}), expected);
+    EXPECT_EQ(texts({"--subtitle-file", folder / "western.srt:de"}), expected);
+    EXPECT_NE(program::Run({"ffprobe", "-v", "error", "-show_entries", "stream_tags=language",
+                            "-select_streams", "s", folder / "out.mp4"})
+                  .out.find("language=ger"),
+              std::string::npos);
+    EXPECT_EQ(texts({"--subtitle-file", folder / "greek.srt", "--subtitle-charset", "ISO-8859-7"}),
+              "1 00:00:00,500 --> 00:00:01,000 \xCE\xB1  ");
+    for (const char* bad : {"none.srt", "missing.srt"})
+        EXPECT_EQ(Call({TwoSounds(), folder / "no.mp4", "--subtitle-file", folder / bad}).code, 2);
+    EXPECT_EQ(Call({TwoSounds(), folder / "no.mp4", "--subtitle-file", folder / "utf8.srt",
+                    "--subtitle-charset", "?"})
+                  .code,
+              2);
+}
+
+TEST(Tracks, TextsAboutTheMovieAreReplacedOrLeftOut) {
+    const Folder folder;
+    ASSERT_EQ(Call({TwoSounds(), folder / "a.mkv", "--length", "0.5", "--metadata", "title=Old", "--metadata",
+                    "artist=Nobody", "-q"})
+                  .code,
+              0);
+    const auto tags = [&](const Args& options) {
+        EXPECT_EQ(Call(Join(Args{folder / "a.mkv", folder / "b.mkv", "-y", "-q"}, options)).code, 0);
+        return program::Run({"ffprobe", "-v", "error", "-show_entries", "format_tags=title,artist", "-of",
+                             "compact", folder / "b.mkv"})
+            .out;
+    };
+    EXPECT_EQ(tags({}), "format|tag:title=Old|tag:ARTIST=Nobody\n");
+    EXPECT_EQ(tags({"--metadata", "Artist=", "--metadata", "title=New=Newer"}),
+              "format|tag:title=New=Newer\n");
+    EXPECT_EQ(tags({"--no-metadata", "--metadata", "title=New"}), "format|tag:title=New\n");
+    EXPECT_EQ(Call({TwoSounds(), folder / "c.mkv", "--metadata", "title"}).code, 2);
+}
+
 } // namespace
