@@ -21,6 +21,7 @@ set(public_headers
   host/convert/Work.h
   host/source/Crop.h
   host/source/Deinterlace.h
+  host/source/TrackWishes.h
   logsink/LogSink.h
   media/Decoders.h
   media/EncodeParam.h

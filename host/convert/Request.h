@@ -5,7 +5,7 @@
 #include "host/convert/Preferences.h"
 #include "host/source/Crop.h"
 #include "host/source/Deinterlace.h"
-#include "host/source/SourceInfo.h"
+#include "host/source/TrackWishes.h"
 
 #include <chrono>
 #include <cstdint>

@@ -5,6 +5,7 @@
 #include "host/source/Completeness.h"
 #include "host/source/Crop.h"
 #include "host/source/Deinterlace.h"
+#include "host/source/TrackWishes.h"
 
 #include <cstdint>
 #include <optional>
@@ -25,11 +26,6 @@ enum class StreamKind { kPictures, kSound, kSubtitles, kCover, kAttachment, kDat
 
 /// What people call a stream of that kind: "pictures", "cover".
 std::string_view KindName(StreamKind kind);
-
-struct Tag {
-    std::string key; ///< As FFmpeg calls it, "title"; others as the container has them.
-    std::string value;
-};
 
 /// The display that the pictures were made for: chromaticities as in CIE 1931, luminances in cd/m².
 struct MasteringDisplay {
@@ -146,9 +142,6 @@ struct SourceInfo {
     std::optional<SoundStreamInfo> sound;
     Promise promise; ///< Of these two.
 };
-
-/// Which streams of a kind are wanted: by their numbers, or by their languages; nothing: all of them.
-using TrackList = std::optional<std::vector<std::string>>;
 
 struct SourceChoice {
     bool pictures = true; ///< Look for pictures at all.
