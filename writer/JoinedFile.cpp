@@ -155,12 +155,10 @@ JoinedFile::JoinedFile(const std::string& target, const EncodeParam& param, cons
     try {
         AddStreams();
         part_.WriteHeader();
+        part_.Keep();
     } catch (...) {
-        const WriterFailure failure = part_.Explain(std::current_exception());
-        part_.Remove();
-        throw WriterFailure(failure);
+        throw WriterFailure(part_.Explain(std::current_exception()));
     }
-    record_->SetTemporaryPath(part_.Path());
 }
 
 JoinedFile::~JoinedFile() = default;

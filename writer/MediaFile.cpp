@@ -70,12 +70,10 @@ MediaFile::MediaFile(const std::string& target, const EncodeParam& param, const 
         OpenStages();
         part_.WriteHeader();
         StartPictures();
+        part_.Keep();
     } catch (...) {
-        const WriterFailure failure = part_.Explain(std::current_exception());
-        part_.Remove();
-        throw WriterFailure(failure);
+        throw WriterFailure(part_.Explain(std::current_exception()));
     }
-    record_->SetTemporaryPath(part_.Path());
 }
 
 MediaFile::~MediaFile() = default;

@@ -54,6 +54,16 @@ PartFile::PartFile(const std::string& target, const FilePlan& plan, std::shared_
     }
 }
 
+PartFile::~PartFile() {
+    if (!kept_)
+        files_.Remove(path_);
+}
+
+void PartFile::Keep() {
+    record_->SetTemporaryPath(path_);
+    kept_ = true;
+}
+
 void PartFile::WriteHeader() {
     packets_->WriteHeader(room_ ? room_->Size() : 0);
     if (io_->Flush() != 0)

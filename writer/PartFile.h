@@ -20,7 +20,8 @@ namespace writer {
 /// Where the data of `target` really goes. Throws WriterFailure when nothing may be written there.
 std::string UsableTarget(const std::string& target, const WriterOptions& options);
 
-/// Created beside the target, under its name with ".part". Its record is told how it grows.
+/// Created beside the target, under its name with ".part"; removed again unless it is kept. Its record is told how it
+/// grows.
 class PartFile {
 public:
     /// Throws WriterFailure, and leaves nothing behind then.
@@ -28,7 +29,10 @@ public:
              FileSystem& files);
     PartFile(const PartFile&) = delete;
     PartFile& operator=(const PartFile&) = delete;
-    ~PartFile() = default;
+    ~PartFile();
+
+    /// It stays from now on, whatever happens, and the record knows where.
+    void Keep();
 
     /// Streams are added to it before WriteHeader.
     PacketWriter& Streams() { return *packets_; }
@@ -71,6 +75,7 @@ private:
     const std::shared_ptr<FileRecord> record_;
     FileSystem& files_;
     std::string path_;
+    bool kept_ = false;
     std::optional<Mp4Room> room_;
     FragmentLog fragments_;
     std::unique_ptr<AvioFile> io_;
