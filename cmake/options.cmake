@@ -27,13 +27,10 @@ add_library(movieconv_options INTERFACE)
 target_include_directories(movieconv_options INTERFACE ${PROJECT_SOURCE_DIR})
 target_link_libraries(movieconv_options INTERFACE Threads::Threads)
 target_compile_options(movieconv_options INTERFACE -Wall -Wextra -Wpedantic $<$<BOOL:${MOVIECONV_WERROR}>:-Werror>)
-# Those of GCC's warnings that follow the flow of values. They go astray in what a sanitizer has put in between, and in
-# strings built from parts, where they differ even with the length of the folder's name.
-set(MOVIECONV_NO_FLOW_WARNINGS
+# Not those of GCC's warnings that follow the flow of values: they go astray in strings built from parts and in what a
+# sanitizer has put in between, and come and go with the length of the folder's name.
+target_compile_options(movieconv_options INTERFACE
   $<$<CXX_COMPILER_ID:GNU>:-Wno-array-bounds;-Wno-maybe-uninitialized;-Wno-restrict;-Wno-stringop-overflow>)
-if(CMAKE_CXX_FLAGS MATCHES "-fsanitize")
-  target_compile_options(movieconv_options INTERFACE ${MOVIECONV_NO_FLOW_WARNINGS})
-endif()
 target_link_options(movieconv_options INTERFACE -Wl,--as-needed)
 if(NOT CMAKE_CXX_FLAGS MATCHES "-fsanitize")
   target_link_options(movieconv_options INTERFACE -Wl,--no-undefined)

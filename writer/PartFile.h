@@ -20,8 +20,8 @@ namespace writer {
 /// Where the data of `target` really goes. Throws WriterFailure when nothing may be written there.
 std::string UsableTarget(const std::string& target, const WriterOptions& options);
 
-/// Created beside the target, under its name with ".part"; removed again unless it is kept. Its record is told how it
-/// grows.
+/// Created beside the target, under its name with ".part"; removed again unless it is kept. Its record is
+/// told how it grows.
 class PartFile {
 public:
     /// Throws WriterFailure, and leaves nothing behind then.
