@@ -200,6 +200,7 @@ void Course::UpdateClock() {
 void Course::FollowWishes() {
     if (wishes_.stop && !userStopped_) {
         userStopped_ = true;
+        cutShort_ = outcome_ == kNone;
         Stop();
     }
     if (!userStopped_ && wishes_.pause != paused_)
@@ -295,6 +296,8 @@ void Course::ReportProgress() {
 
 Verdict Course::Conclude() {
     TakeNews();
+    if (cutShort_ && outcome_ == kOutcomeCompleted)
+        outcome_ = kOutcomeStopped; // to the engine a source that is stopped may seem to have ended
     if (const VideoImage* last = movie_.LastPicture(); last != nullptr && wishes_.pictures.Wants())
         wishes_.pictures.OfferLast(*last); // the engine shows but some
     Show();

@@ -88,6 +88,7 @@ private:
     SpeedMeter speed_;
     bool paused_ = false;
     bool userStopped_ = false;
+    bool cutShort_ = false;            // by the user, before the engine's end was known
     std::optional<Failure> brokenOff_; // why the program itself ended the conversion
     Phase toldPhase_ = Phase::kConverting;
     WorkClock::Time toldAt_{};

@@ -75,10 +75,7 @@ public:
     Job& Conversion() { return job_; }
 
     /// Ends it; what is converted until then is not the whole movie.
-    void Stop() {
-        stopped_ = true;
-        job_.Stop();
-    }
+    void Stop() { job_.Stop(); }
     const Movie& What() const { return movie_; }
     Progress Latest() const {
         const std::lock_guard lock(mutex_);
@@ -99,8 +96,6 @@ public:
     void Ended(const Verdict& news) override {
         Verdict verdict = news;
         try {
-            if (verdict.outcome == Outcome::kDone && stopped_)
-                verdict.outcome = Outcome::kStopped; // a source that is stopped seems to have ended
             if (verdict.outcome == Outcome::kDone)
                 journal_.NoteDone(movie_.output, source_, batch_.settings_);
         } catch (const Failure& failure) {
@@ -119,7 +114,6 @@ private:
     BatchJournal& journal_;
     const Movie movie_;
     const SourceMark source_;
-    std::atomic<bool> stopped_{false};
     mutable std::mutex mutex_;
     Progress latest_;
     std::optional<Verdict> ending_;

@@ -78,10 +78,7 @@ public:
     Job& Conversion() { return job_; }
 
     /// Ends it; whatever it then has made is not the piece.
-    void Stop() {
-        stopped_ = true;
-        job_.Stop();
-    }
+    void Stop() { job_.Stop(); }
 
     /// Seconds of pictures that it brings; of the rest none, unless nothing else is made.
     double Length() const {
@@ -114,8 +111,6 @@ public:
         Verdict verdict = news;
         int64_t bytes = 0;
         try {
-            if (verdict.outcome == Outcome::kDone && stopped_)
-                verdict.outcome = Outcome::kStopped; // a source that is stopped seems to have ended
             if (verdict.outcome == Outcome::kDone) {
                 CheckCount(verdict);
                 bytes = SealPiece(file_, plan_, foreman_.order_.planPath, number_);
@@ -155,7 +150,6 @@ private:
     const Plan& plan_;
     const int number_;
     const std::string file_;
-    std::atomic<bool> stopped_{false};
     int64_t pictures_ = 0;
     mutable std::mutex mutex_;
     Progress latest_;
