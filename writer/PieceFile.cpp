@@ -312,7 +312,7 @@ bool PieceReader::Read(AVPacket& packet, int only) {
             avio_skip(io, size);
             continue;
         }
-        av::CheckMemory(av_new_packet(&packet, static_cast<int>(size)));
+        av::CheckMemory(av_grow_packet(&packet, static_cast<int>(size))); // keeps what is beside the data
         if (avio_read(io, packet.data, static_cast<int>(size)) != size)
             Refuse();
         packet.stream_index = static_cast<int>(stream);
