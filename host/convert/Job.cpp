@@ -1,5 +1,6 @@
 #include "host/convert/Job.h"
 
+#include "host/convert/Attempt.h"
 #include "host/convert/Course.h"
 #include "host/convert/EncodePlan.h"
 #include "host/convert/Outlet.h"
@@ -16,14 +17,6 @@
 
 namespace movieconv {
 namespace {
-
-Failure Unexpected(const std::exception& error) noexcept {
-    try {
-        return {Category::kInternal, error.what()};
-    } catch (const std::bad_alloc&) {
-        return {Category::kInternal, {}, Reason::kNoMemory};
-    }
-}
 
 /// For the calling thread, and so for all that it is going to make.
 void StandBack(int niceness) {
@@ -87,16 +80,7 @@ private:
 
 void Job::Impl::Run() noexcept {
     StandBack(request_.niceness);
-    Verdict verdict;
-    try {
-        verdict = Convert();
-    } catch (Failure& failure) {
-        verdict.failure = std::move(failure);
-    } catch (const std::bad_alloc&) {
-        verdict.failure = Failure(Category::kInternal, {}, Reason::kNoMemory);
-    } catch (const std::exception& error) {
-        verdict.failure = Unexpected(error);
-    }
+    Verdict verdict = Attempt([this] { return Convert(); });
     {
         const std::lock_guard lock(mutex_);
         verdict_ = std::move(verdict);

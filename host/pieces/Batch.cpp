@@ -1,5 +1,6 @@
 #include "host/pieces/Batch.h"
 
+#include "host/convert/Attempt.h"
 #include "host/convert/EncodePlan.h"
 #include "host/convert/Failure.h"
 #include "host/convert/Sources.h"
@@ -154,16 +155,7 @@ const Verdict* Batch::Result() const {
 }
 
 void Batch::Run() noexcept {
-    Verdict verdict;
-    try {
-        verdict = Perform();
-    } catch (Failure& failure) {
-        verdict.failure = std::move(failure);
-    } catch (const std::bad_alloc&) {
-        verdict.failure = Failure(Category::kInternal, {}, Reason::kNoMemory);
-    } catch (const std::exception& error) {
-        verdict.failure = Failure(Category::kInternal, error.what());
-    }
+    Verdict verdict = Attempt([this] { return Perform(); });
     tasks_.clear();
     {
         const std::lock_guard lock(mutex_);

@@ -1,6 +1,7 @@
 #include "host/pieces/Foreman.h"
 
 #include "host/convert/Amounts.h"
+#include "host/convert/Attempt.h"
 #include "host/convert/Failure.h"
 #include "host/convert/OutputCheck.h"
 #include "host/convert/Sources.h"
@@ -197,16 +198,7 @@ void Foreman::Wait() {
 }
 
 void Foreman::Run() noexcept {
-    Verdict verdict;
-    try {
-        verdict = Perform();
-    } catch (Failure& failure) {
-        verdict.failure = std::move(failure);
-    } catch (const std::bad_alloc&) {
-        verdict.failure = Failure(Category::kInternal, {}, Reason::kNoMemory);
-    } catch (const std::exception& error) {
-        verdict.failure = Failure(Category::kInternal, error.what());
-    }
+    Verdict verdict = Attempt([this] { return Perform(); });
     {
         const std::lock_guard lock(mutex_);
         tasks_.clear();

@@ -1,0 +1,41 @@
+// The outermost frame of a thread that works: whatever is thrown becomes a verdict.
+#ifndef MOVIECONV_HOST_CONVERT_ATTEMPT_H
+#define MOVIECONV_HOST_CONVERT_ATTEMPT_H
+
+#include "host/convert/Failure.h"
+#include "host/convert/Observer.h"
+
+#include <exception>
+#include <new>
+#include <utility>
+
+namespace movieconv {
+
+/// Of what a well-kept program does not throw. Without memory for the sentence it is a lack of memory.
+inline Failure Unexpected(const std::exception& error) noexcept {
+    try {
+        return {Category::kInternal, error.what()};
+    } catch (const std::bad_alloc&) {
+        return {Category::kInternal, {}, Reason::kNoMemory};
+    }
+}
+
+/// The verdict of `perform`, or the failure that it throws.
+template <class Perform>
+Verdict Attempt(Perform perform) noexcept {
+    Verdict verdict;
+    try {
+        verdict = perform();
+    } catch (Failure& failure) {
+        verdict.failure = std::move(failure);
+    } catch (const std::bad_alloc&) {
+        verdict.failure = Failure(Category::kInternal, {}, Reason::kNoMemory);
+    } catch (const std::exception& error) {
+        verdict.failure = Unexpected(error);
+    }
+    return verdict;
+}
+
+} // namespace movieconv
+
+#endif
