@@ -20,12 +20,12 @@ inline Failure Unexpected(const std::exception& error) noexcept {
     }
 }
 
-/// The verdict of `perform`, or the failure that it throws.
-template <class Perform>
-Verdict Attempt(Perform perform) noexcept {
+/// The verdict of the worker's `perform`, or the failure that it throws.
+template <class Worker>
+Verdict Attempt(Worker& worker, Verdict (Worker::*perform)()) noexcept {
     Verdict verdict;
     try {
-        verdict = perform();
+        verdict = (worker.*perform)();
     } catch (Failure& failure) {
         verdict.failure = std::move(failure);
     } catch (const std::bad_alloc&) {

@@ -80,7 +80,7 @@ private:
 
 void Job::Impl::Run() noexcept {
     StandBack(request_.niceness);
-    Verdict verdict = Attempt([this] { return Convert(); });
+    Verdict verdict = Attempt(*this, &Impl::Convert);
     {
         const std::lock_guard lock(mutex_);
         verdict_ = std::move(verdict);

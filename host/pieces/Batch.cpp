@@ -155,7 +155,8 @@ const Verdict* Batch::Result() const {
 }
 
 void Batch::Run() noexcept {
-    Verdict verdict = Attempt([this] { return Perform(); });
+    // cppcheck-suppress throwInNoexceptFunction ; Attempt catches it
+    Verdict verdict = Attempt(*this, &Batch::Perform);
     tasks_.clear();
     {
         const std::lock_guard lock(mutex_);

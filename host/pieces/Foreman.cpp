@@ -198,7 +198,8 @@ void Foreman::Wait() {
 }
 
 void Foreman::Run() noexcept {
-    Verdict verdict = Attempt([this] { return Perform(); });
+    // cppcheck-suppress throwInNoexceptFunction ; Attempt catches it
+    Verdict verdict = Attempt(*this, &Foreman::Perform);
     {
         const std::lock_guard lock(mutex_);
         tasks_.clear();
