@@ -80,6 +80,7 @@ private:
 
 void Job::Impl::Run() noexcept {
     StandBack(request_.niceness);
+    // cppcheck-suppress throwInNoexceptFunction ; Attempt catches it
     Verdict verdict = Attempt(*this, &Impl::Convert);
     {
         const std::lock_guard lock(mutex_);
