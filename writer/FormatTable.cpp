@@ -60,7 +60,7 @@ constexpr const char* kFfv1Options = "level=3,g=1,slicecrc=1"; // every picture 
 
 constexpr std::array kPictureCodecs{
     PictureCodec{kXvid,  AV_CODEC_ID_MPEG4,      "mpeg4",      kPlanar,     false, false, 0.0, kQuantiser, kOneSpeed, ""},
-    PictureCodec{kH264,  AV_CODEC_ID_H264,       "libx264",    kPlanar,     false, true,  1.5, kCrf51, kX26Speeds, ""},
+    PictureCodec{kH264,  AV_CODEC_ID_H264,       "libx264",    kPlanar,     false, true,  2.0, kCrf51, kX26Speeds, ""},
     PictureCodec{kHevc,  AV_CODEC_ID_HEVC,       "libx265",    kPlanar,     true,  true,  0.0, kCrf51, kX26Speeds, kX265Options},
     PictureCodec{kMjpg,  AV_CODEC_ID_MJPEG,      "mjpeg",      kPlanarFull, false, false, 0.0, kQuantiser, kOneSpeed, ""},
     PictureCodec{kVp8,   AV_CODEC_ID_VP8,        "libvpx",     kPlanar,     false, false, 1.0, kCapped63, kVpxSpeeds, kVpxOptions},
