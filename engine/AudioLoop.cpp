@@ -7,7 +7,7 @@
 
 namespace {
 
-constexpr double kMinDuration = 0.0001; // seconds
+constexpr double kShortestSound = 0.0001; // seconds
 constexpr int32_t kNotifyBlocks = 30;
 constexpr int32_t kNotifySamples = 1000;
 
@@ -37,7 +37,7 @@ int ConvThread::process_audio_only() {
 
 int ConvThread::AudioLoop::Run() {
     pAudioFormat = SourceFormat(converter.pAudioDecoder);
-    if (!pAudioFormat || pAudioFormat->dDuration < kMinDuration) {
+    if (!pAudioFormat || pAudioFormat->dDuration < kShortestSound) {
         LogAt(kLogError, L"MovieConv::Without audio decoder or zero length.");
         return ReportFailure(MC_RESULT_SOURCE, "There is no sound to convert.");
     }

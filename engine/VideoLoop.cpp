@@ -9,7 +9,7 @@
 
 namespace {
 
-constexpr double kMinDuration = 0.001;       // seconds
+constexpr double kShortestPictures = 0.001;  // seconds
 constexpr uint32_t kEstimateInterval = 1000; // ms
 constexpr uint32_t kNotifyInterval = 80;     // ms
 constexpr int64_t kNoTime = -1;
@@ -45,7 +45,7 @@ int ConvThread::process_video_only() {
 
 int ConvThread::VideoLoop::Run() {
     pVideoFormat = SourceFormat(converter.pVideoDecoder);
-    if (!pVideoFormat || pVideoFormat->dDuration < kMinDuration)
+    if (!pVideoFormat || pVideoFormat->dDuration < kShortestPictures)
         return ReportNoPictures();
     if (!CreateFirstFile())
         return ReportFailure(MC_RESULT_CANNOT_OPEN, "");

@@ -110,6 +110,9 @@ public:
 
     /// Throws std::bad_alloc.
     void Set(const char* key, const char* value) { CheckMemory(av_dict_set(&entries_, key, value, 0)); }
+    /// What is opened with these opens nothing else by itself. An empty list would allow all. Throws
+    /// std::bad_alloc.
+    void AllowNoProtocol() { Set("protocol_whitelist", "none"); }
     AVDictionary** Get() { return &entries_; }
 
 private:

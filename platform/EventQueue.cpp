@@ -12,17 +12,13 @@
 #include <utility>
 #include <vector>
 
-namespace {
-
-struct Parameter {
-    EventParamName name;
-    EventParamType type;
-    std::vector<std::byte> data;
-};
-
-} // namespace
-
 struct OpaqueEventRef {
+    struct Parameter {
+        EventParamName name;
+        EventParamType type;
+        std::vector<std::byte> data;
+    };
+
     OpaqueEventRef(OSType theClass, UInt32 theKind) : eventClass(theClass), eventKind(theKind) {}
 
     auto Find(EventParamName name) {
@@ -147,7 +143,7 @@ OSStatus SetEventParameter(EventRef event, EventParamName name, EventParamType t
     if (!event || (!data && size > 0))
         return paramErr;
     try {
-        Parameter parameter{name, type, std::vector<std::byte>(size)};
+        OpaqueEventRef::Parameter parameter{name, type, std::vector<std::byte>(size)};
         std::copy_n(static_cast<const std::byte*>(data), size, parameter.data.begin());
         const auto found = event->Find(name);
         if (found != event->parameters.end())

@@ -11,16 +11,16 @@
 namespace writer {
 namespace {
 
-constexpr size_t kHeaderSize = 8; // size and type
+constexpr size_t kBoxHeader = 8; // size and type
 
 [[noreturn]] void ThrowSenseless() {
     throw WriterFailure(kWriterErrorFinish, "The temporary file does not hold all that was written.");
 }
 
 /// Takes big-endian numbers from a stretch of bytes.
-class Bytes {
+class BoxReader {
 public:
-    explicit Bytes(std::span<const uint8_t> bytes) : bytes_(bytes) {}
+    explicit BoxReader(std::span<const uint8_t> bytes) : bytes_(bytes) {}
 
     bool Empty() const { return bytes_.empty(); }
 
@@ -40,12 +40,12 @@ public:
     uint32_t U32() { return static_cast<uint32_t>(Number(4)); }
 
     /// The content of the next box, whose type is stored.
-    Bytes Box(uint32_t& type) {
+    BoxReader Box(uint32_t& type) {
         const uint32_t size = U32();
         type = U32();
-        if (size < kHeaderSize)
+        if (size < kBoxHeader)
             ThrowSenseless();
-        return Bytes(Take(size - kHeaderSize));
+        return BoxReader(Take(size - kBoxHeader));
     }
 
 private:
@@ -60,12 +60,12 @@ constexpr uint32_t Type(const char (&name)[5]) {
 constexpr uint32_t kNotKey = 0x10000; // in the flags of a sample
 
 /// What the parts of one track's fragment say, in their order.
-class Track {
+class TrackRuns {
 public:
-    Track(int64_t base, const std::function<void(const PlacedPacket&)>& take)
+    TrackRuns(int64_t base, const std::function<void(const PlacedPacket&)>& take)
         : next_(base), base_(base), take_(take) {}
 
-    void Take(uint32_t type, Bytes content) {
+    void Take(uint32_t type, BoxReader content) {
         if (type == Type("tfhd"))
             TakeHeader(content);
         else if (type == Type("tfdt"))
@@ -75,7 +75,7 @@ public:
     }
 
 private:
-    void TakeHeader(Bytes content) {
+    void TakeHeader(BoxReader content) {
         const uint32_t flags = content.U32();
         stream_ = static_cast<int>(content.U32()) - 1;
         if ((flags & 0x1) != 0)
@@ -87,7 +87,7 @@ private:
         flags_ = (flags & 0x20) != 0 ? content.U32() : 0;
     }
 
-    void TakeRun(Bytes content) {
+    void TakeRun(BoxReader content) {
         const uint32_t flags = content.U32();
         const uint32_t count = content.U32();
         if ((flags & 0x1) != 0)
@@ -119,14 +119,14 @@ private:
 void ReadFragment(std::span<const uint8_t> head, int64_t position,
                   const std::function<void(const PlacedPacket&)>& take) {
     uint32_t type = 0;
-    Bytes parts = Bytes(head).Box(type);
+    BoxReader parts = BoxReader(head).Box(type);
     while (!parts.Empty()) {
-        Bytes part = parts.Box(type);
+        BoxReader part = parts.Box(type);
         if (type != Type("traf"))
             continue;
-        Track track(position, take);
+        TrackRuns track(position, take);
         while (!part.Empty()) {
-            const Bytes content = part.Box(type);
+            const BoxReader content = part.Box(type);
             track.Take(type, content);
         }
     }
@@ -143,8 +143,8 @@ void FragmentLog::Take(int64_t position, const uint8_t* data, int64_t size) noex
             if (unwanted < 0 || unwanted >= size)
                 return;
             const auto have = static_cast<int64_t>(box_.size());
-            const int64_t end = have < static_cast<int64_t>(kHeaderSize) ? static_cast<int64_t>(kHeaderSize)
-                                                                         : Bytes(box_).U32();
+            const int64_t end = have < static_cast<int64_t>(kBoxHeader) ? static_cast<int64_t>(kBoxHeader)
+                                                                        : BoxReader(box_).U32();
             const int64_t count = std::min(size - unwanted, end - have);
             Collect(data + unwanted, count);
             data += unwanted + count;
@@ -159,12 +159,12 @@ void FragmentLog::Take(int64_t position, const uint8_t* data, int64_t size) noex
 /// More of the box, of which nothing but a fragment's head is kept.
 void FragmentLog::Collect(const uint8_t* data, int64_t size) {
     box_.insert(box_.end(), data, data + size);
-    if (box_.size() < kHeaderSize)
+    if (box_.size() < kBoxHeader)
         return;
-    Bytes header(box_);
+    BoxReader header(box_);
     const uint32_t whole = header.U32();
     const uint32_t type = header.U32();
-    if (whole < kHeaderSize)
+    if (whole < kBoxHeader)
         ThrowSenseless();
     if (type == Type("moof") && box_.size() < whole) {
         box_.reserve(whole);

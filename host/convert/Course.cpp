@@ -22,11 +22,9 @@
 namespace movieconv {
 namespace {
 
-constexpr std::chrono::milliseconds kTick{500};
 constexpr std::chrono::milliseconds kShortestInterval{100}; // between two reports of progress
 constexpr std::chrono::milliseconds kSuspicious{1500};      // between two ticks: the process was suspended
 constexpr double kLeastLength = 0.0011;                     // seconds: less means all the rest to the engine
-constexpr double kMostPercent = 99.9;                       // until the file has its name
 constexpr double kEarlyEnd = 1; // seconds by which a source may fall short of the length asked for
 
 /// Whether the file is shorter than when it was opened.
@@ -50,10 +48,6 @@ double LengthOf(const Request& request, const SourceInfo& source) {
                                                     : LengthToConvert(request, source);
 }
 
-WorkClock::Time Now() {
-    return std::chrono::steady_clock::now();
-}
-
 } // namespace
 
 Course::Course(const Request& request, Movie& movie, Wishes& wishes, Observer& observer)
@@ -66,7 +60,7 @@ Course::Course(const Request& request, Movie& movie, Wishes& wishes, Observer& o
       watch_(request_, movie.Info(), wishes.bell),
       files_(observer),
       engine_(MakeEngine(request_, movie.Info(), clips_.Pictures(), clips_.Sound(), watch_.OptionSet())),
-      clock_(Now()) {
+      clock_(WorkClock::Now()) {
     if (request.piece && request.piece->pictures)
         movie.EndPicturesAt(ToSeconds(request.piece->end));
     else if (request.length)
@@ -90,7 +84,7 @@ Verdict Course::Run() {
     if (!request_.piece && (lengthKnown || request_.length) &&
         HasRates(request_, ChooseFormat(request_), movie_.Info()))
         WarnOfSmallRoom();
-    clock_.Skip(Now());
+    clock_.Skip(WorkClock::Now());
     RunEngine(request_.begin, request_.length.value_or(0));
     while (GoesOn())
         RunEngine(0, request_.length ? std::max(length_ - clips_.Offset(), kLeastLength) : 0);
@@ -165,7 +159,7 @@ unsigned Course::OnProgress(void* context, unsigned kind, unsigned value, uintpt
 
 void Course::WaitForEnd() {
     while (outcome_ == kNone) {
-        wishes_.bell.Wait(paused_ ? std::nullopt : std::optional(kTick));
+        wishes_.bell.Wait(paused_ ? std::nullopt : std::optional(WorkClock::kTick));
         UpdateClock();
         FollowWishes();
         TakeNews();
@@ -188,7 +182,7 @@ void Course::LookAfterFile() {
 }
 
 void Course::UpdateClock() {
-    const WorkClock::Time now = Now();
+    const WorkClock::Time now = WorkClock::Now();
     if (now - clock_.Last() > kSuspicious)
         clock_.Skip(now);
     if (paused_ || watch_.WaitsForRoom() > 0)
@@ -276,7 +270,7 @@ Phase Course::CurrentPhase() const {
 }
 
 void Course::ReportProgress() {
-    const WorkClock::Time now = Now();
+    const WorkClock::Time now = WorkClock::Now();
     const Phase phase = CurrentPhase();
     const bool changed = phase != toldPhase_;
     if (!changed && now - toldAt_ < kShortestInterval)

@@ -7,6 +7,9 @@
 
 namespace movieconv {
 
+/// The progress that is told at most until an output has its name.
+constexpr double kMostPercent = 99.9;
+
 /// A mean over the last ten seconds of work, which is steady and still follows the material.
 class SpeedMeter {
 public:

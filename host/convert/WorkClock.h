@@ -11,6 +11,10 @@ class WorkClock {
 public:
     using Time = std::chrono::steady_clock::time_point;
 
+    static constexpr std::chrono::milliseconds kTick{500}; ///< How often to call Tick.
+
+    static Time Now() { return std::chrono::steady_clock::now(); }
+
     explicit WorkClock(Time now) : last_(now) {}
 
     /// Counts the time since the last call unless the clock stands. To be called regularly.

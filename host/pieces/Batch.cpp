@@ -20,13 +20,6 @@ namespace {
 
 namespace fs = std::filesystem;
 
-constexpr std::chrono::milliseconds kTick{500};
-constexpr double kMostPercent = 99.9;
-
-WorkClock::Time Now() {
-    return std::chrono::steady_clock::now();
-}
-
 /// The more others are concerned, the worse.
 int Badness(Category category) {
     switch (category) {
@@ -122,7 +115,7 @@ private:
 };
 
 Batch::Batch(BatchOrder order, Observer& observer, Loop loop)
-    : order_(std::move(order)), outlet_(observer, std::move(loop)), clock_(Now()) {}
+    : order_(std::move(order)), outlet_(observer, std::move(loop)), clock_(WorkClock::Now()) {}
 
 Batch::~Batch() {
     Stop();
@@ -192,7 +185,7 @@ Verdict Batch::Perform() {
     outlet_.Started({fmt::format("{} movies", count_), order_.folder, 0, false});
     const auto processors = static_cast<int>(std::max(1U, std::thread::hardware_concurrency()));
     const int jobs = order_.jobs > 0 ? order_.jobs : (processors + 1) / 2;
-    clock_.Skip(Now());
+    clock_.Skip(WorkClock::Now());
     while (!tasks_.empty() || !waiting.empty()) {
         const bool ends = stop_ || (worst_ && worst_->Kind() == Category::kNoSpace);
         for (const auto& task : tasks_)
@@ -205,7 +198,7 @@ Verdict Batch::Perform() {
         }
         if (tasks_.empty() && (ends || waiting.empty()))
             break;
-        bell_.Wait(paused_ ? std::nullopt : std::optional(kTick));
+        bell_.Wait(paused_ ? std::nullopt : std::optional(WorkClock::kTick));
         FollowWishes();
         TakeEnded();
         Report(waiting.size());
@@ -324,9 +317,9 @@ void Batch::FollowWishes() {
     }
     paused_ = paused_ && !stop_;
     if (paused_)
-        clock_.Stand(Now());
+        clock_.Stand(WorkClock::Now());
     else
-        clock_.Go(Now());
+        clock_.Go(WorkClock::Now());
 }
 
 /// The lengths of movies that wait are taken to be those of the others on average.

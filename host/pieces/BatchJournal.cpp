@@ -12,7 +12,7 @@
 namespace movieconv {
 namespace {
 
-constexpr int64_t kMostBytes = 256 << 20;
+constexpr int64_t kLargestJournal = 256 << 20;
 
 std::string HashOf(const SourceMark& mark) {
     return DigestOf(
@@ -36,7 +36,7 @@ std::string CheckOf(const std::string& state, const std::string& output, const s
 
 BatchJournal::BatchJournal(const std::string& folder) : path_(folder + "/movieconv.journal") {
     if (access(path_.c_str(), F_OK) == 0)
-        Read(ReadWhole(path_, kMostBytes));
+        Read(ReadWhole(path_, kLargestJournal));
 }
 
 void BatchJournal::Read(const std::string& text) {

@@ -22,13 +22,6 @@
 namespace movieconv {
 namespace {
 
-constexpr std::chrono::milliseconds kTick{500};
-constexpr double kMostPercent = 99.9;
-
-WorkClock::Time Now() {
-    return std::chrono::steady_clock::now();
-}
-
 double LengthOf(const Piece& piece) {
     return ToSeconds(piece.end - piece.begin);
 }
@@ -160,7 +153,7 @@ private:
 };
 
 Foreman::Foreman(PieceOrder order, Observer& observer, Loop loop)
-    : order_(std::move(order)), outlet_(observer, std::move(loop)), clock_(Now()) {}
+    : order_(std::move(order)), outlet_(observer, std::move(loop)), clock_(WorkClock::Now()) {}
 
 Foreman::~Foreman() {
     Stop();
@@ -335,7 +328,7 @@ Verdict Foreman::MakeAll(const Plan& plan, std::deque<int> missing) {
     Verdict verdict;
     verdict.outcome = Outcome::kDone;
     const int jobs = missing.empty() ? 0 : JobsFor(plan);
-    clock_.Skip(Now());
+    clock_.Skip(WorkClock::Now());
     while (verdict.outcome == Outcome::kDone || !tasks_.empty()) {
         if (stop_ && verdict.outcome == Outcome::kDone)
             verdict.outcome = Outcome::kStopped;
@@ -349,7 +342,7 @@ Verdict Foreman::MakeAll(const Plan& plan, std::deque<int> missing) {
         }
         if (tasks_.empty())
             break;
-        bell_.Wait(paused_ ? std::nullopt : std::optional(kTick));
+        bell_.Wait(paused_ ? std::nullopt : std::optional(WorkClock::kTick));
         FollowWishes();
         TakeEnded(verdict);
         Report(Phase::kConverting);
@@ -394,9 +387,9 @@ void Foreman::FollowWishes() {
     if (stop_)
         paused_ = false;
     if (paused_)
-        clock_.Stand(Now());
+        clock_.Stand(WorkClock::Now());
     else
-        clock_.Go(Now());
+        clock_.Go(WorkClock::Now());
 }
 
 void Foreman::ForAll(void (Job::*tell)()) {
@@ -439,14 +432,14 @@ Verdict Foreman::JoinAll(const Plan& plan) {
     double told = 0;
     Verdict joined = JoinPieces(plan, order_.planPath, order_.replace, outlet_, [&](double share) {
         constexpr double kStep = 0.05;
-        clock_.Go(Now());
+        clock_.Go(WorkClock::Now());
         if (share >= told + kStep) {
             told = share;
             Report(Phase::kFinishing, share);
         }
         return !stop_;
     });
-    clock_.Go(Now());
+    clock_.Go(WorkClock::Now());
     joined.worked = clock_.Seconds();
     if (stop_ && joined.outcome != Outcome::kDone) {
         joined.outcome = Outcome::kStopped;

@@ -15,7 +15,7 @@ namespace movieconv {
 namespace {
 
 constexpr int kVersion = 1;
-constexpr int64_t kMostBytes = 16 << 20;
+constexpr int64_t kLargestPlan = 16 << 20;
 
 Json AsJson(const Piece& piece) {
     Json json{{"kind", "pictures"}, {"begin", piece.begin}, {"end", piece.end}, {"pictures", piece.pictures}};
@@ -76,14 +76,14 @@ bool IsUtf8(const std::string& text) {
     }
 }
 
-[[noreturn]] void Refuse(const std::string& why) {
+[[noreturn]] void RefusePlan(const std::string& why) {
     throw std::invalid_argument(why);
 }
 
 int64_t Natural(const Json& json, const char* name) {
     const Json& value = json.at(name);
     if (!value.is_number_integer() || value.get<int64_t>() < 0)
-        Refuse(fmt::format("\"{}\" is not a number from 0 on", name));
+        RefusePlan(fmt::format("\"{}\" is not a number from 0 on", name));
     return value.get<int64_t>();
 }
 
@@ -92,7 +92,7 @@ std::string Path(const Json& json) {
     const auto text = json.get<std::string>();
     const std::filesystem::path path(text);
     if (!path.is_absolute() || path.lexically_normal() != path || text.find('\0') != std::string::npos)
-        Refuse(fmt::format("\"{}\" is not an absolute path", text));
+        RefusePlan(fmt::format("\"{}\" is not an absolute path", text));
     return text;
 }
 
@@ -114,30 +114,30 @@ Piece PieceFrom(const Json& json) {
     if (json.contains("tickBefore"))
         piece.tick = json.at("tickBefore").get<int64_t>();
     if (json.at("kind") != "pictures" || piece.end <= piece.begin || piece.pictures < 1)
-        Refuse("a piece holds no pictures");
+        RefusePlan("a piece holds no pictures");
     return piece;
 }
 
 std::vector<Piece> PiecesFrom(const Json& json) {
     if (!json.is_array() || json.size() < 2 || json.size() > std::size_t{kMostPieces} + 1)
-        Refuse(fmt::format("\"pieces\" is not a list of 2 to {}", kMostPieces + 1));
+        RefusePlan(fmt::format("\"pieces\" is not a list of 2 to {}", kMostPieces + 1));
     std::vector<Piece> pieces;
     for (std::size_t i = 0; i + 1 < json.size(); ++i) {
         pieces.push_back(PieceFrom(json.at(i)));
         if (i > 0 && pieces[i].begin != pieces[i - 1].end)
-            Refuse(fmt::format("piece {} does not begin where the one before it ends", i));
+            RefusePlan(fmt::format("piece {} does not begin where the one before it ends", i));
     }
     if (json.back().at("kind") != "rest")
-        Refuse("the last piece is not the rest");
+        RefusePlan("the last piece is not the rest");
     return pieces;
 }
 
 Plan PlanFrom(const Json& json) {
     if (!json.is_object() || !json.contains("version"))
-        Refuse("it is not a plan");
+        RefusePlan("it is not a plan");
     if (json.at("version") != kVersion)
-        Refuse(fmt::format("it has version {}, this program knows version {}", json.at("version").dump(),
-                           kVersion));
+        RefusePlan(fmt::format("it has version {}, this program knows version {}", json.at("version").dump(),
+                               kVersion));
     Plan plan;
     plan.pictures = PiecesFrom(json.at("pieces"));
     plan.versions = json.at("madeWith").get<std::map<std::string, std::string>>();
@@ -152,14 +152,14 @@ Plan PlanFrom(const Json& json) {
         plan.division.length = division.at("pieceLength").get<double>();
     plan.hash = HashOf(AsJson(plan));
     if (json.at("hash") != plan.hash)
-        Refuse("it was changed or cut since it was written");
+        RefusePlan("it was changed or cut since it was written");
     return plan;
 }
 
 } // namespace
 
 Plan ReadPlan(const std::string& path) {
-    const std::string text = ReadWhole(path, kMostBytes);
+    const std::string text = ReadWhole(path, kLargestPlan);
     try {
         return PlanFrom(Json::parse(text));
     } catch (const Json::parse_error&) {

@@ -14,7 +14,7 @@
 namespace movieconv {
 namespace {
 
-[[noreturn]] void Refuse(const std::string& what) {
+[[noreturn]] void RefuseSetting(const std::string& what) {
     throw std::invalid_argument(what);
 }
 
@@ -68,7 +68,7 @@ void FromJson(const Json& json, Value& value) {
         const auto text = json.get<std::string>();
         const std::optional<uint32_t> code = text.empty() ? 0 : ParseCode(text);
         if (!code)
-            Refuse("\"" + text + "\" is no code");
+            RefuseSetting("\"" + text + "\" is no code");
         value = *code;
     } else if constexpr (std::is_enum_v<Value>) {
         value = static_cast<Value>(json.get<int>());
@@ -88,13 +88,13 @@ void FromJson(const Json& json, Value& value) {
     } else if constexpr (std::is_integral_v<Value>) {
         const auto number = json.get<int64_t>();
         if (!json.is_number_integer() || number < 0 || number > std::numeric_limits<Value>::max())
-            Refuse("a number is out of its range");
+            RefuseSetting("a number is out of its range");
         value = static_cast<Value>(number);
     } else {
         value = json.get<Value>();
         if constexpr (std::is_floating_point_v<Value>)
             if (!std::isfinite(value) || value < 0)
-                Refuse("a number is out of its range");
+                RefuseSetting("a number is out of its range");
     }
 }
 
@@ -168,7 +168,7 @@ public:
     void Finish() const {
         for (const auto& [name, value] : json_.items())
             if (known_.count(name) == 0)
-                Refuse("\"" + name + "\" is no setting");
+                RefuseSetting("\"" + name + "\" is no setting");
     }
 
 private:

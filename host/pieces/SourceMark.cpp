@@ -1,6 +1,7 @@
 #include "host/pieces/Plan.h"
 
 #include "host/convert/Failure.h"
+#include "host/pieces/Descriptor.h"
 #include "host/pieces/Digest.h"
 
 #include <algorithm>
@@ -22,23 +23,6 @@ Failure CannotRead(const std::string& path, const std::string& reason) {
     return {Category::kSource, fmt::format("cannot read \"{}\": {}", path, reason)};
 }
 
-/// Closes it in the end.
-class Descriptor {
-public:
-    explicit Descriptor(const std::string& path)
-        : number_(open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK)) {}
-    ~Descriptor() {
-        if (number_ >= 0)
-            close(number_);
-    }
-    Descriptor(const Descriptor&) = delete;
-    Descriptor& operator=(const Descriptor&) = delete;
-    int Number() const { return number_; }
-
-private:
-    const int number_;
-};
-
 std::string EdgeOf(const std::string& path, int descriptor, int64_t offset, int64_t size) {
     Digest digest;
     if (!AddFile(digest, descriptor, offset, size))
@@ -49,7 +33,7 @@ std::string EdgeOf(const std::string& path, int descriptor, int64_t offset, int6
 } // namespace
 
 SourceMark MarkOf(const std::string& path) {
-    const Descriptor file(path);
+    const Descriptor file(open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK));
     struct stat status {};
     if (file.Number() < 0 || fstat(file.Number(), &status) != 0)
         throw CannotRead(path, std::strerror(errno));

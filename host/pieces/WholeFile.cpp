@@ -1,6 +1,7 @@
 #include "host/pieces/WholeFile.h"
 
 #include "host/convert/Failure.h"
+#include "host/pieces/Descriptor.h"
 #include "text/Path.h"
 #include "text/WriteAll.h"
 
@@ -15,24 +16,6 @@
 
 namespace movieconv {
 namespace {
-
-/// Closes it in the end, unless that was done.
-class Descriptor {
-public:
-    explicit Descriptor(int number) : number_(number) {}
-    ~Descriptor() { Close(); }
-    Descriptor(const Descriptor&) = delete;
-    Descriptor& operator=(const Descriptor&) = delete;
-    int Number() const { return number_; }
-    bool Close() {
-        const int number = number_;
-        number_ = -1;
-        return number < 0 || close(number) == 0;
-    }
-
-private:
-    int number_;
-};
 
 Failure CannotWrite(const std::string& path) {
     const bool full = errno == ENOSPC || errno == EDQUOT;

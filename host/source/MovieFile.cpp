@@ -19,7 +19,6 @@ constexpr char kFollowed[] = "hls,concat"; // let each of them be looked at befo
 // pictures, and no further playlist.
 constexpr char kParts[] = "aac,ac3,aiff,asf,avi,caf,dts,dv,eac3,flac,flv,h264,hevc,ivf,m4v,matroska,mov,mp3,"
                           "mpeg,mpegts,mpegvideo,mxf,nut,obu,ogg,truehd,vc1,w64,wav";
-constexpr char kNoProtocol[] = "none"; // an empty list would allow all
 
 bool IsOneOf(const AVInputFormat& format, const char* names) {
     return av_match_name(format.name, names) != 0 || av_match_list(format.name, names, ',') > 0;
@@ -76,7 +75,7 @@ const AVInputFormat& MovieFile::Recognise(const std::string& url, bool playlists
 void MovieFile::Open(const std::string& url, const AVInputFormat& format) {
     av::Options settings;
     settings.Set("pattern_type", "none"); // "%d" in a name is no pattern
-    settings.Set("protocol_whitelist", kNoProtocol);
+    settings.AllowNoProtocol();
     if (IsOneOf(format, kPlaylists))
         settings.Set("format_whitelist", (std::string(kParts) + "," + format.name).c_str());
     if (av_match_name("concat", format.name) != 0) { // the one that opens files without asking

@@ -19,7 +19,6 @@ namespace {
 constexpr char kTexts[] =
     "ass,jacosub,lrc,microdvd,mpl2,mpsub,pjs,realtext,sami,srt,stl,subviewer,subviewer1,vplayer,"
     "webvtt";
-constexpr char kNoProtocol[] = "none";
 
 std::string ReadWhole(const std::string& path) {
     constexpr std::size_t kMost = std::size_t{64} << 20;
@@ -88,7 +87,7 @@ SubtitleFile::SubtitleFile(const std::string& path, const std::string& charset) 
     constexpr int kBuffer = 4096;
     io_ = av::NewIo(kBuffer, false, this, Read, nullptr, Seek);
     av::Options settings;
-    settings.Set("protocol_whitelist", kNoProtocol);
+    settings.AllowNoProtocol();
     settings.Set("format_whitelist", kTexts);
     AVFormatContext* context = avformat_alloc_context();
     if (context == nullptr)

@@ -1,5 +1,7 @@
 #include "host/terminal/Describe.h"
 
+#include "host/terminal/JsonReporter.h"
+
 #include <nlohmann/json.hpp>
 
 #include <string>
@@ -10,8 +12,6 @@ namespace movieconv {
 namespace {
 
 using Json = nlohmann::ordered_json;
-
-constexpr int kSchemaVersion = 1;
 
 /// The figure when it is told.
 Json Told(double value) {
@@ -106,7 +106,7 @@ Json Object(const StreamInfo& stream) {
 } // namespace
 
 std::string DescribeAsJson(const SourceInfo& source) {
-    Json object{{"v", kSchemaVersion},
+    Json object{{"v", JsonReporter::kVersion},
                 {"event", "info"},
                 {"path", source.path},
                 {"container", source.container},

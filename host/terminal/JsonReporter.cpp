@@ -8,8 +8,7 @@
 namespace movieconv {
 namespace {
 
-constexpr int kSchemaVersion = 1;
-constexpr double kInterval = 0.25;
+constexpr double kReportInterval = 0.25;
 
 std::string Number(std::optional<double> value) {
     return value && std::isfinite(*value) ? fmt::format("{:.3f}", *value) : "null";
@@ -51,7 +50,7 @@ std::string JsonString(std::string_view bytes) {
 }
 
 void JsonReporter::Print(std::string_view event, const std::string& fields) const {
-    streams_.Print(fmt::format("{{\"v\":{},\"event\":\"{}\"{}{}}}\n", kSchemaVersion, event,
+    streams_.Print(fmt::format("{{\"v\":{},\"event\":\"{}\"{}{}}}\n", kVersion, event,
                                fields.empty() ? "" : ",", fields));
 }
 
@@ -64,7 +63,7 @@ void JsonReporter::Started(const Start& report) {
 void JsonReporter::Progressed(const Progress& report) {
     if (!report.phaseChanged && report.worked < nextAt_)
         return;
-    nextAt_ = report.worked + kInterval;
+    nextAt_ = report.worked + kReportInterval;
     Print("progress",
           fmt::format("\"phase\":\"{}\",\"percent\":{},\"position_s\":{},\"speed\":{},\"left_s\":{},"
                       "\"worked_s\":{},\"bytes\":{},\"finished\":{},\"clip\":{}",

@@ -11,6 +11,9 @@ namespace movieconv {
 
 class JsonReporter final : public Reporter {
 public:
+    /// Of everything that is told as JSON.
+    static constexpr int kVersion = 1;
+
     explicit JsonReporter(const StandardStreams& streams) : streams_(streams) {}
 
     void Started(const Start& report) override;

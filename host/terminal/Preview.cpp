@@ -22,7 +22,7 @@ extern "C" {
 namespace movieconv {
 namespace {
 
-constexpr std::chrono::seconds kInterval{1};
+constexpr std::chrono::seconds kPictureInterval{1};
 constexpr std::size_t kPngHead = 33; // signature and header chunk, which come first
 
 /// The text chunk behind the head by which our pictures are known again.
@@ -161,7 +161,7 @@ void Preview::Run() {
             failure_ = "no memory"; // short enough to need none
         }
         lock.lock();
-        changed_.wait_for(lock, kInterval, [&] { return finishing_; });
+        changed_.wait_for(lock, kPictureInterval, [&] { return finishing_; });
     }
 }
 

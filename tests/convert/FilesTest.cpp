@@ -5,6 +5,7 @@
 #include "host/convert/OutputCheck.h"
 #include "host/convert/WriterWatch.h"
 #include "tests/convert/Listener.h"
+#include "tests/convert/Wanted.h"
 #include "tests/support/Folder.h"
 #include "tests/writer/TestSource.h"
 #include "text/Utf8.h"
@@ -22,13 +23,6 @@ namespace {
 
 namespace fs = std::filesystem;
 using namespace movieconv;
-
-Request To(const std::string& output) {
-    Request request;
-    request.input = "source";
-    request.output = output;
-    return request;
-}
 
 TEST(OutputCheck, RefusesWhatWouldBeLost) {
     const Folder folder;

@@ -5,6 +5,7 @@
 #include "host/convert/Formats.h"
 #include "host/convert/SizePlan.h"
 #include "media/FourCC.h"
+#include "tests/convert/Wanted.h"
 
 #include <gtest/gtest.h>
 
@@ -33,13 +34,6 @@ SourceInfo Source(double seconds = 60) {
     source.pictures = pictures;
     source.sound = sound;
     return source;
-}
-
-Request To(const std::string& output) {
-    Request request;
-    request.input = "source";
-    request.output = output;
-    return request;
 }
 
 /// What is refused, by category and reason; nothing when it is not.

@@ -20,10 +20,6 @@ std::string Short() {
                              test_movies::Join(test_movies::CountedPictures(1), test_movies::Beeps(1)));
 }
 
-bool Has(const std::string& text, const std::string& part) {
-    return text.find(part) != std::string::npos;
-}
-
 /// A folder "in" of two movies and a text, and a movie beside it.
 struct Movies {
     Folder folder;

@@ -56,10 +56,6 @@ struct Planned {
     Result Join() const { return Call({"-q", "--join", plan}); }
 };
 
-bool Has(const std::string& text, const std::string& part) {
-    return text.find(part) != std::string::npos;
-}
-
 TEST(Pieces, GiveTheSameBytesInAnyOrderAndInOneProcess) {
     const Planned farm;
     farm.MakeAll();

@@ -15,7 +15,7 @@ using movieconv::Reached;
 using movieconv::Shortfall;
 using movieconv::SourceChoice;
 
-constexpr std::optional<double> kNone;
+constexpr std::optional<double> kUntold;
 
 TEST(Completeness, ComparesWhatWasReadWithWhatWasAnnounced) {
     const struct {
@@ -23,17 +23,17 @@ TEST(Completeness, ComparesWhatWasReadWithWhatWasAnnounced) {
         Reached reached;
         std::optional<double> missing; // 0 for a mere cut
     } cases[] = {
-        {{}, {10, 10}, kNone},
-        {{false, 10, 10, kNone}, {9.1, 9.1}, kNone},
-        {{false, 10, kNone, kNone}, {8.9, 10}, 1.1},
-        {{false, 10, 10, kNone}, {10, 8.5}, 1.5},
-        {{false, 10, 10, kNone}, {10, kNone}, kNone}, // nobody wanted the sound to its end
-        {{false, 1000, kNone, kNone}, {990.5, kNone}, kNone},
-        {{false, 1000, kNone, kNone}, {989, kNone}, 11},
-        {{false, kNone, kNone, 10}, {4, 9.5}, kNone},
-        {{false, kNone, kNone, 10}, {4, 8}, 2},
-        {{true, kNone, kNone, kNone}, {10, 10}, 0},
-        {{true, 10, 10, kNone}, {kNone, kNone}, kNone},
+        {{}, {10, 10}, kUntold},
+        {{false, 10, 10, kUntold}, {9.1, 9.1}, kUntold},
+        {{false, 10, kUntold, kUntold}, {8.9, 10}, 1.1},
+        {{false, 10, 10, kUntold}, {10, 8.5}, 1.5},
+        {{false, 10, 10, kUntold}, {10, kUntold}, kUntold}, // nobody wanted the sound to its end
+        {{false, 1000, kUntold, kUntold}, {990.5, kUntold}, kUntold},
+        {{false, 1000, kUntold, kUntold}, {989, kUntold}, 11},
+        {{false, kUntold, kUntold, 10}, {4, 9.5}, kUntold},
+        {{false, kUntold, kUntold, 10}, {4, 8}, 2},
+        {{true, kUntold, kUntold, kUntold}, {10, 10}, 0},
+        {{true, 10, 10, kUntold}, {kUntold, kUntold}, kUntold},
     };
     for (const auto& test : cases) {
         SCOPED_TRACE(&test - cases);

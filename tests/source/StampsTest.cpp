@@ -13,7 +13,7 @@ using movieconv::SoundTimeline;
 using movieconv::StampRepair;
 
 constexpr int64_t kStep = 400'000;
-constexpr std::optional<int64_t> kNone;
+constexpr std::optional<int64_t> kNoStamp;
 
 TEST(StampRepair, KeepsRisingStampsAndMendsTheOthers) {
     const struct {
@@ -25,10 +25,10 @@ TEST(StampRepair, KeepsRisingStampsAndMendsTheOthers) {
         {{70}, 0, {70}},
         {{-5, 3, 4, 900'000'000}, 0, {-5, 3, 4, 900'000'000}},
         // A missing stamp is one step on, or between its neighbours.
-        {{0, kNone, kNone}, 2, {0, kStep, 2 * kStep}},
-        {{0, kNone, 2 * kStep}, 1, {0, kStep, 2 * kStep}},
-        {{0, kNone, 100}, 1, {0, 50, 100}},
-        {{kNone, kStep * 3}, 1, {kStep * 2, kStep * 3}},
+        {{0, kNoStamp, kNoStamp}, 2, {0, kStep, 2 * kStep}},
+        {{0, kNoStamp, 2 * kStep}, 1, {0, kStep, 2 * kStep}},
+        {{0, kNoStamp, 100}, 1, {0, 50, 100}},
+        {{kNoStamp, kStep * 3}, 1, {kStep * 2, kStep * 3}},
         // Equal and falling ones are lifted, and a single wild one is passed over.
         {{0, 0, 2 * kStep}, 1, {0, kStep, 2 * kStep}},
         {{5 * kStep, kStep, 2 * kStep}, 2, {5 * kStep, 6 * kStep, 7 * kStep}},

@@ -9,6 +9,10 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+inline bool Has(const std::string& text, const std::string& part) {
+    return text.find(part) != std::string::npos;
+}
+
 /// What a process has left.
 struct ProcessResult {
     int code; ///< Exit code, or 128 plus the signal that ended it.

@@ -65,10 +65,6 @@ std::string Probe(const std::string& path) {
         .out;
 }
 
-bool Has(const std::string& text, const std::string& part) {
-    return text.find(part) != std::string::npos;
-}
-
 TEST(CarryOver, PutsIntoTheFileWhatItsFormatHoldsAndTellsTheRest) {
     const Folder folder;
     const std::string whole = MakeWhole(folder);

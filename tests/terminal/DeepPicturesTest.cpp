@@ -55,7 +55,7 @@ std::string Hdr10() {
 std::string Hlg() {
     return Chart("chart-hlg.mp4", ":colorprim=9:colormatrix=9:transfer=18");
 }
-std::string Counted() {
+std::string DeepCounted() {
     return Make("deep-counted.mp4", Join(CountedPictures(0.4), Args{"-c:v", "mpeg4"}));
 }
 std::string Plain() {
@@ -117,7 +117,7 @@ TEST(DeepPictures, KeepBitsAndLightWhereTheCodecHasThem) {
         {Plain(), {"--preset", "archive"}, "o.mkv", kBt709, 10},
         {Plain(), {"--preset", "small", "--depth", "8"}, "o.mp4", kBt709, 8},
         {Plain(), {"--preset", "standard"}, "o.mp4", kBt709, 8},
-        {Counted(), {"--preset", "small", "--depth", "10"}, "o.mp4", 2, 10},
+        {DeepCounted(), {"--preset", "small", "--depth", "10"}, "o.mp4", 2, 10},
     };
     for (const auto& test : cases) {
         SCOPED_TRACE(&test - cases);

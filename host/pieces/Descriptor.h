@@ -1,0 +1,31 @@
+// A file descriptor that is closed.
+#ifndef MOVIECONV_HOST_PIECES_DESCRIPTOR_H
+#define MOVIECONV_HOST_PIECES_DESCRIPTOR_H
+
+#include <unistd.h>
+
+namespace movieconv {
+
+/// Closes it in the end, unless that was done. That of a failed open stays negative.
+class Descriptor {
+public:
+    explicit Descriptor(int number) : number_(number) {}
+    ~Descriptor() { Close(); }
+    Descriptor(const Descriptor&) = delete;
+    Descriptor& operator=(const Descriptor&) = delete;
+    int Number() const { return number_; }
+
+    /// False, with errno set, when the system tells a failure.
+    bool Close() {
+        const int number = number_;
+        number_ = -1;
+        return number < 0 || close(number) == 0;
+    }
+
+private:
+    int number_;
+};
+
+} // namespace movieconv
+
+#endif
