@@ -78,12 +78,43 @@ struct SplitRgbForm {
 using FastSplitForm = SplitRgbForm<14, 4211, 8258, 1606, -2425, -4768, 7193, 7193, -6029, -1163, 0>;
 using SimpleSplitForm = SplitRgbForm<10, 263, 516, 100, -152, -298, 450, 450, -377, -73, 512>;
 
+/// A product of words as processors round it: half of the upper word of twice the product, to the nearest.
+constexpr int RoundedProduct(int a, int b) {
+    return (a * b + (1 << 14)) >> 15;
+}
+
+/// What a sample of U or V gives by one multiplication of words. The seed is the byte below the sample: it
+/// moves the multiplication's rounding to where the equation rounds.
+struct SeededTerm {
+    int weight, seed, constant;
+
+    constexpr int operator()(int sample) const {
+        return RoundedProduct((sample - 128) * 256 + seed, weight) + constant;
+    }
+};
+
+/// The term that is (factor * sample + offset) >> shift for every sample.
+constexpr SeededTerm MakeSeededTerm(int factor, int offset, int shift) {
+    const auto equation = [=](int sample) { return (factor * sample + offset) >> shift; };
+    for (int seed = 0; seed < 256; ++seed) {
+        SeededTerm term{factor << (7 - shift), seed, 0};
+        term.constant = equation(0) - term(0);
+        int sample = 0;
+        while (sample < 256 && term(sample) == equation(sample))
+            ++sample;
+        if (sample == 256)
+            return term;
+    }
+    throw "no seed makes this term exact";
+}
+
 /// YUV to RGB in 16-bit lanes: component = clamp((luma + chroma) >> 7) with
 ///   luma = 149 * Y - kBias and chroma = the term of the equation >> (its bits - 7), + kBias.
 /// The sum may leave 16 bits only where the clamp gives the same as a saturated sum. That holds for red and
-/// green for every bias from 5228 to 9147. The term of blue does not fit 16 bits: it is split into (U - 128)
-/// * 256, which is added first, and the rest, which is never negative. A term factor * x + offset, to be
-/// shifted right by s, is (factor >> s) * x + (offset >> s) + (the remainders >> s).
+/// green for every bias from 5228 to 9147. The term of blue does not fit 16 bits: it is split into
+/// (U - 128) * 256 + seed, which is added first, and the rest, which is never negative. Green depends on two
+/// samples: a term factor * x + offset, to be shifted right by s, is (factor >> s) * x + (offset >> s) + (the
+/// remainders >> s).
 template <int kBitsOfSet, int kLumaOfSet, int kRedV, int kRedOffset, int kGreenU, int kGreenV,
           int kGreenOffset, int kBlueU, int kBlueOffset>
 struct YuvToRgbForm {
@@ -95,16 +126,19 @@ struct YuvToRgbForm {
 
     static constexpr int Whole(int value) { return value >> kShift; }
     static constexpr int Rest(int value) { return value & ((1 << kShift) - 1); }
+    static constexpr int Scaled(int value) { return value * (1 << kShift); }
 
-    static constexpr int kRedWhole = Whole(kRedV), kRedRest = Rest(kRedV);
-    static constexpr int kRedConstant = Whole(kRedOffset) + kBias, kRedRestConstant = Rest(kRedOffset);
+    static constexpr SeededTerm kRed = MakeSeededTerm(kRedV, kRedOffset + Scaled(kBias), kShift);
+
     static constexpr int kGreenUWhole = Whole(kGreenU), kGreenURest = Rest(kGreenU);
     static constexpr int kGreenVWhole = Whole(kGreenV), kGreenVRest = Rest(kGreenV);
     static constexpr int kGreenConstant = Whole(kGreenOffset) + kBias,
                          kGreenRestConstant = Rest(kGreenOffset);
-    static constexpr int kBlueWhole = Whole(kBlueU) - 256, kBlueRest = Rest(kBlueU);
-    static constexpr int kBlueConstant = Whole(kBlueOffset) + 128 * 256 + kBias,
-                         kBlueRestConstant = Rest(kBlueOffset);
+
+    static constexpr SeededTerm kBlue =
+        MakeSeededTerm(kBlueU - Scaled(256), kBlueOffset + Scaled(128 * 256 + kBias), kShift);
+    static constexpr int kBlueRestConstant = kBlue.constant - kBlue.seed;
+    static_assert(kBlue(0) >= kBlue.seed);
 };
 
 using FastYuvForm = YuvToRgbForm<13, 9536, 13074, -1826095, -3203, -6660, 1109918, 16532, -2268594>;

@@ -22,9 +22,15 @@ struct LanePacked {
     static Vec LumaWords(Vec packed) {
         return kOrder == kYuy2 ? LowBytes(packed) : HighBytes(packed);
     }
+    /// Indices that put the luma bytes of a lane at `lumaPlace`, 0 or 8, its chroma bytes at the other.
     template <PackedOrder kOrder>
-    static Vec ChromaWords(Vec packed) {
-        return kOrder == kYuy2 ? HighBytes(packed) : LowBytes(packed);
+    static constexpr LaneBytes LumaThenChroma(size_t lumaPlace) {
+        LaneBytes indices{};
+        for (size_t i = 0; i < 8; ++i) {
+            indices[lumaPlace + i] = static_cast<int8_t>(2 * i + (kOrder == kYuy2 ? 0 : 1));
+            indices[8 - lumaPlace + i] = static_cast<int8_t>(2 * i + (kOrder == kYuy2 ? 1 : 0));
+        }
+        return indices;
     }
 
     /// Words of which the upper byte is chroma, the lower one zero.
@@ -125,9 +131,12 @@ struct LanePacked {
         ForRowBlocks<3, 2>(
             rgb, packed, size, [](const RowKernels& k) { return k.bgr24FromPacked[kOrder]; },
             [](uint8_t* to, const uint8_t* from) {
-                const Vec halves[2] = {V::LoadLanes(from, 32), V::LoadLanes(from + 16, 32)};
-                const Vec y = V::PackUs16(LumaWords<kOrder>(halves[0]), LumaWords<kOrder>(halves[1]));
-                const Vec uv = V::PackUs16(ChromaWords<kOrder>(halves[0]), ChromaWords<kOrder>(halves[1]));
+                constexpr LaneBytes kLumaFirst = LumaThenChroma<kOrder>(0);
+                constexpr LaneBytes kLumaLast = LumaThenChroma<kOrder>(8);
+                const Vec first = V::Shuffle8(V::LoadLanes(from, 32), V::Lane(kLumaFirst));
+                const Vec second = V::Shuffle8(V::LoadLanes(from + 16, 32), V::Lane(kLumaLast));
+                const Vec y = V::template Blend16<0xF0>(first, second);
+                const Vec uv = V::MiddleHalves(first, second);
                 To::Bgr24Target::Store(
                     to, To::template MakeComponents<FastYuvForm>(y, To::template MakeTerms<FastYuvForm>(uv)));
             });

@@ -27,21 +27,19 @@ struct LaneToRgb {
         const auto weighted = [=](int ofU, int ofV) {
             return V::MulAddU8S8(V::Set16(ofU | ofV << 8), centred);
         };
-        const auto rest = [=](int ofU, int ofV, int constant) {
-            return V::template Sra16<F::kShift>(
-                V::Add16(weighted(ofU, ofV), V::Set16(constant + 128 * (ofU + ofV))));
-        };
         const auto plus = [](int constant, Vec words) { return V::Add16(words, V::Set16(constant)); };
-        const Vec red = plus(F::kRedConstant + 128 * F::kRedWhole,
-                             V::Add16(weighted(0, F::kRedWhole), rest(0, F::kRedRest, F::kRedRestConstant)));
+        const auto seeded = [=](const SeededTerm& term, int constant, Vec samples) {
+            return plus(constant, V::MulRounded16(samples, V::Set16(term.weight)));
+        };
+        const Vec u = V::Or(V::template Sll16<8>(centred), V::Set16(F::kBlue.seed));
+        const Vec v = V::Or(V::And(centred, V::Set16(-0x100)), V::Set16(F::kRed.seed));
         // The whole factors of green are negative, the weights are not.
+        const Vec greenRest =
+            V::template Sra16<F::kShift>(plus(F::kGreenRestConstant + 128 * (F::kGreenURest + F::kGreenVRest),
+                                              weighted(F::kGreenURest, F::kGreenVRest)));
         const Vec green = plus(F::kGreenConstant + 128 * (F::kGreenUWhole + F::kGreenVWhole),
-                               V::Sub16(rest(F::kGreenURest, F::kGreenVRest, F::kGreenRestConstant),
-                                        weighted(-F::kGreenUWhole, -F::kGreenVWhole)));
-        const Vec blueRest =
-            plus(F::kBlueConstant + 128 * F::kBlueWhole,
-                 V::Add16(weighted(F::kBlueWhole, 0), rest(F::kBlueRest, 0, F::kBlueRestConstant)));
-        return {red, green, V::template Sll16<8>(centred), blueRest};
+                               V::Sub16(greenRest, weighted(-F::kGreenUWhole, -F::kGreenVWhole)));
+        return {seeded(F::kRed, F::kRed.constant, v), green, u, seeded(F::kBlue, F::kBlueRestConstant, u)};
     }
 
     /// Bytes of sixteen pixels a lane: the even pixels, then the odd ones, as the chroma terms ask for.

@@ -125,21 +125,30 @@ struct ChromaTerms {
     int16x8_t red, green, blue, blueRest;
 };
 
+/// Words of centred samples, the seed of their term below each.
+inline int16x8_t WithSeed(const SeededTerm& term, uint8x8_t samples) {
+    const uint8x8_t centred = veor_u8(samples, vdup_n_u8(0x80));
+    const uint8x8_t seeds = vdup_n_u8(static_cast<uint8_t>(term.seed));
+    return vreinterpretq_s16_u8(vzip1q_u8(vcombine_u8(seeds, seeds), vcombine_u8(centred, centred)));
+}
+
+inline int16x8_t Product(const SeededTerm& term, int16x8_t samples, int constant) {
+    return vaddq_s16(vqrdmulhq_n_s16(samples, static_cast<int16_t>(term.weight)),
+                     vdupq_n_s16(static_cast<int16_t>(constant)));
+}
+
 template <class Form>
 ChromaTerms MakeTerms(uint8x8_t u, uint8x8_t v) {
     using F = Form;
     const auto constant = [](int value) { return vdupq_n_u16(static_cast<uint16_t>(value)); };
-    const auto term = [](uint16x8_t wholes, uint16x8_t rests) {
-        return vreinterpretq_s16_u16(vsraq_n_u16(wholes, rests, F::kShift)); // rests are never negative
-    };
-    return {
-        term(AddWeighted<F::kRedWhole>(constant(F::kRedConstant), v),
-             AddWeighted<F::kRedRest>(constant(F::kRedRestConstant), v)),
-        term(AddWeighted<F::kGreenVWhole>(AddWeighted<F::kGreenUWhole>(constant(F::kGreenConstant), u), v),
-             AddWeighted<F::kGreenVRest>(AddWeighted<F::kGreenURest>(constant(F::kGreenRestConstant), u), v)),
-        vreinterpretq_s16_u16(vshll_n_u8(veor_u8(u, vdup_n_u8(0x80)), 8)),
-        term(AddWeighted<F::kBlueWhole>(constant(F::kBlueConstant), u),
-             AddWeighted<F::kBlueRest>(constant(F::kBlueRestConstant), u))};
+    const uint16x8_t wholes =
+        AddWeighted<F::kGreenVWhole>(AddWeighted<F::kGreenUWhole>(constant(F::kGreenConstant), u), v);
+    const uint16x8_t rests =
+        AddWeighted<F::kGreenVRest>(AddWeighted<F::kGreenURest>(constant(F::kGreenRestConstant), u), v);
+    const int16x8_t blue = WithSeed(F::kBlue, u);
+    return {Product(F::kRed, WithSeed(F::kRed, v), F::kRed.constant),
+            vreinterpretq_s16_u16(vsraq_n_u16(wholes, rests, F::kShift)), // rests are never negative
+            blue, Product(F::kBlue, blue, F::kBlueRestConstant)};
 }
 
 template <class Form>

@@ -31,6 +31,7 @@ struct Avx2 {
     static Vec Sub16(Vec a, Vec b) { return _mm256_sub_epi16(a, b); }
     static Vec Add32(Vec a, Vec b) { return _mm256_add_epi32(a, b); }
     static Vec MulHigh16(Vec a, Vec b) { return _mm256_mulhi_epi16(a, b); }
+    static Vec MulRounded16(Vec a, Vec b) { return _mm256_mulhrs_epi16(a, b); }
     static Vec MulAdd16(Vec a, Vec b) { return _mm256_madd_epi16(a, b); }
     static Vec MulAddU8S8(Vec a, Vec b) { return _mm256_maddubs_epi16(a, b); }
     static Vec Average16(Vec a, Vec b) { return _mm256_avg_epu16(a, b); }
@@ -46,6 +47,8 @@ struct Avx2 {
 
     static Vec EvenDwords(Vec a, Vec b) { return ShuffleDwords<_MM_SHUFFLE(2, 0, 2, 0)>(a, b); }
     static Vec OddDwords(Vec a, Vec b) { return ShuffleDwords<_MM_SHUFFLE(3, 1, 3, 1)>(a, b); }
+    /// The upper half of each lane of a, then the lower one of b.
+    static Vec MiddleHalves(Vec a, Vec b) { return ShuffleDwords<_MM_SHUFFLE(1, 0, 3, 2)>(a, b); }
     template <int kOrder>
     static Vec ShuffleDwords(Vec a, Vec b) {
         return _mm256_castps_si256(_mm256_shuffle_ps(_mm256_castsi256_ps(a), _mm256_castsi256_ps(b), kOrder));

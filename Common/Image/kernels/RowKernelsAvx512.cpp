@@ -40,9 +40,8 @@ void Bgr24FromPacked(Rows rgb, Rows packed, Size size) {
         return kAvx2Kernels.bgr24FromPacked[kOrder](rgb, packed, size);
     using Form = FastYuvForm;
     using Order = Packed<kOrder>;
-    static constexpr Table kLuma = MakeTable([](int i) { return Order::Y(PixelAt(i)); });
-    static constexpr Table kChroma =
-        MakeTable([](int i) { return i % 2 == 0 ? Order::U(PixelAt(i)) : Order::V(PixelAt(i)); });
+    static constexpr Table kLuma = MakeTable([](int i) { return Order::Y(i); });
+    static constexpr Table kChroma = MakeTable([](int i) { return i % 2 == 0 ? Order::U(i) : Order::V(i); });
     const Bgr24Target<Memory> store;
     const Pick luma(kLuma);
     const Pick chroma(kChroma);

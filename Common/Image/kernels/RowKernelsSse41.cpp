@@ -64,6 +64,7 @@ struct Sse41 {
     static Vec Sub16(Vec a, Vec b) { return _mm_sub_epi16(a, b); }
     static Vec Add32(Vec a, Vec b) { return _mm_add_epi32(a, b); }
     static Vec MulHigh16(Vec a, Vec b) { return _mm_mulhi_epi16(a, b); }
+    static Vec MulRounded16(Vec a, Vec b) { return _mm_mulhrs_epi16(a, b); }
     static Vec MulAdd16(Vec a, Vec b) { return _mm_madd_epi16(a, b); }
     static Vec MulAddU8S8(Vec a, Vec b) { return _mm_maddubs_epi16(a, b); }
     static Vec Average16(Vec a, Vec b) { return _mm_avg_epu16(a, b); }
@@ -79,6 +80,8 @@ struct Sse41 {
 
     static Vec EvenDwords(Vec a, Vec b) { return ShuffleDwords<_MM_SHUFFLE(2, 0, 2, 0)>(a, b); }
     static Vec OddDwords(Vec a, Vec b) { return ShuffleDwords<_MM_SHUFFLE(3, 1, 3, 1)>(a, b); }
+    /// The upper half of each lane of a, then the lower one of b.
+    static Vec MiddleHalves(Vec a, Vec b) { return ShuffleDwords<_MM_SHUFFLE(1, 0, 3, 2)>(a, b); }
     template <int kOrder>
     static Vec ShuffleDwords(Vec a, Vec b) {
         return _mm_castps_si128(_mm_shuffle_ps(_mm_castsi128_ps(a), _mm_castsi128_ps(b), kOrder));
