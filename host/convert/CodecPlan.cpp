@@ -82,7 +82,7 @@ void RequireQuality(uint32_t codec, double quality) {
         throw Failure(Category::kRequest,
                       fmt::format("\"{}\" has no constant quality; give it a bit rate", CodeName(codec)));
     }
-    if (quality < best || quality > worst) {
+    if (!(quality >= best && quality <= worst)) { // nor what is no number
         throw Failure(Category::kRequest,
                       fmt::format("the quality of \"{}\" goes from {} (best) to {}, not to {}",
                                   CodeName(codec), best, worst, quality));

@@ -7,6 +7,7 @@
 #include "writer/WriterStatus.h"
 
 #include <algorithm>
+#include <filesystem>
 #include <fmt/format.h>
 
 namespace movieconv {
@@ -55,7 +56,8 @@ void PutSound(EncodeParam& param, const FileFormatInfo& format, const Request& r
 const FileFormatInfo& ChooseFormat(const Request& request) {
     const FileFormatInfo* format =
         request.format ? FindFormat(CodeName(*request.format)) : FindFormatOfFile(request.output);
-    if (format == nullptr && !request.format && request.preferences.format)
+    const bool namesNone = !request.format && std::filesystem::path(request.output).extension().empty();
+    if (namesNone && request.preferences.format)
         format = FindFormat(CodeName(*request.preferences.format));
     if (format == nullptr && request.format) {
         throw Failure(Category::kRequest,

@@ -43,7 +43,7 @@ struct Steps {
 };
 
 struct Preferences {
-    std::optional<uint32_t> format;    ///< Four-character code, for outputs whose name tells none.
+    std::optional<uint32_t> format;    ///< Four-character code, for outputs without an extension.
     std::vector<uint32_t> videoCodecs; ///< The first that the format carries. Empty: the engine's choice.
     std::vector<uint32_t> audioCodecs;
 

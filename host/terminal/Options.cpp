@@ -144,7 +144,6 @@ void AddPictures(CLI::App& app, Options& options) {
         ->group(group);
     app.add_option("--quality", options.request.quality,
                    "Constant quality on the codec's scale, less is better;\nby default the preset's")
-        ->check(CLI::Range(0.0, 63.0).description(""))
         ->type_name("N")
         ->group(group);
     AddParsed(app, "--max-size", ParseBytes, options.request.maxSize, "a size such as 700k, 25M or 4.7G",
@@ -226,6 +225,7 @@ void AddCarried(CLI::App& app, Options& options) {
            },
            "Add the subtitles of a file; may be repeated")
         ->type_name("FILE[:LANG]")
+        ->allow_extra_args(false) // another value needs the option again: INPUT may follow
         ->take_all()
         ->group(group);
     app.add_option("--subtitle-charset", request.subtitleCharset,
@@ -247,6 +247,7 @@ void AddCarried(CLI::App& app, Options& options) {
            },
            "Write a text, as title=Holidays, or with no value\nleave one out; may be repeated")
         ->type_name("KEY=VALUE")
+        ->allow_extra_args(false) // another value needs the option again: INPUT may follow
         ->take_all()
         ->group(group);
 }
@@ -515,6 +516,8 @@ std::optional<Options> ParseOptions(int argc, char** argv) {
         std::fputs(CompletionScript(*options.completion, OptionEntries(app)).c_str(), stdout);
         return std::nullopt;
     }
+    if (options.request.input == "-")
+        options.request.input = "/dev/stdin";
     RequireSense(options);
     if (NeedsOutput(options.task))
         ApplyPreset(options);

@@ -10,6 +10,7 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <cmath>
 #include <string>
 
 namespace {
@@ -134,14 +135,19 @@ TEST(CodecPlan, RefusesWhatFormatOrCodecDoesNotHave) {
     webm.preferences.videoCodecs.push_back(FourCC("VP90"));
     EXPECT_EQ(Refused([&] { ChooseFormat(webm); }), std::nullopt);
     EXPECT_EQ(Refused([&] { ChooseFormat(To("o.xyz")); }), std::pair(Category::kRequest, Reason::kNoFormat));
-    Request named = To("o.xyz");
+    Request named = To("folder.mp4/o");
+    EXPECT_EQ(Refused([&] { ChooseFormat(named); }), std::pair(Category::kRequest, Reason::kNoFormat));
     named.preferences.format = FourCC("MKV ");
     EXPECT_EQ(ChooseFormat(named).fccFormat, FourCC("MKV "));
+    named.output = "o.xyz";
+    EXPECT_EQ(Refused([&] { ChooseFormat(named); }), std::pair(Category::kRequest, Reason::kNoFormat));
 
     Request quality = To("o.mkv");
     quality.videoCodec = FourCC("H264");
-    quality.quality = 52;
-    EXPECT_EQ(Refused([&] { PlanPictures(quality, *FindFormat("mkv"), *source.pictures); }), other);
+    for (const double outside : {-1.0, 52.0, std::nan("")}) {
+        quality.quality = outside;
+        EXPECT_EQ(Refused([&] { PlanPictures(quality, *FindFormat("mkv"), *source.pictures); }), other);
+    }
     quality.quality = 51;
     EXPECT_EQ(Refused([&] { PlanPictures(quality, *FindFormat("mkv"), *source.pictures); }), std::nullopt);
     quality.videoCodec = FourCC("FFV1"); // without loss

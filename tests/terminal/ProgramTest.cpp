@@ -374,8 +374,7 @@ TEST(Program, GetsAlongWithWhateverStandardStreams) {
     EXPECT_EQ(shell("movieconv \"$0\" \"$1\" <&- >&- 2>&-").code, 0);
     EXPECT_EQ(LookAt(folder / "out.mp4").pictures.size(), 25u);
     EXPECT_EQ(shell("movieconv --list-formats >/dev/full").code, 4);
-    EXPECT_NE(shell("cat \"$0\" | movieconv --info /dev/stdin").out.find("length unknown"),
-              std::string::npos);
+    EXPECT_NE(shell("cat \"$0\" | movieconv --info -").out.find("length unknown"), std::string::npos);
     EXPECT_EQ(shell("cat \"$0\" | movieconv --estimate /dev/stdin \"$1\"").code, 2);
 }
 

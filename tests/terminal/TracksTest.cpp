@@ -259,7 +259,7 @@ TEST(Tracks, TextsAboutTheMovieAreReplacedOrLeftOut) {
                   .code,
               0);
     const auto tags = [&](const Args& options) {
-        EXPECT_EQ(Call(Join(Args{folder / "a.mkv", folder / "b.mkv", "-y", "-q"}, options)).code, 0);
+        EXPECT_EQ(Call(Join(options, Args{folder / "a.mkv", folder / "b.mkv", "-y", "-q"})).code, 0);
         return program::Run({"ffprobe", "-v", "error", "-show_entries", "format_tags=title,artist", "-of",
                              "compact", folder / "b.mkv"})
             .out;
