@@ -194,38 +194,84 @@ bool CarryFile(const Movie& movie, const StreamInfo& stream, uint32_t set) {
     return MWAddAttachment(set, stream.fileName.c_str(), stream.mimeType.c_str(), data.data(), size) != 0;
 }
 
-/// Empty when the stream was carried, or is of a kind of which the source itself tells.
-std::string ReasonFor(const Movie& movie, const StreamInfo& stream, const FileFormatInfo& format,
-                      uint32_t set, bool& hasCover) {
+/// What is converted and what was chosen, of a source.
+struct Chosen {
+    int pictures = -1; ///< Stream numbers, -1 for none.
+    int sound = -1;
+    std::vector<int> sounds; ///< Wanted ones.
+    std::vector<int> subtitles;
+
+    bool Wants(const StreamInfo& stream) const {
+        return stream.kind == StreamKind::kSound       ? IsAmong(sounds, stream.index)
+               : stream.kind == StreamKind::kSubtitles ? IsAmong(subtitles, stream.index)
+                                                       : true;
+    }
+};
+
+/// Empty when the format can hold the stream, or it is of a kind of which the source itself tells.
+std::string WhyItStays(const SourceInfo& source, const Chosen& chosen, const StreamInfo& stream,
+                       const FileFormatInfo& format) {
     const uint32_t traits = MWGetFormatTraits(format.fccFormat);
     switch (stream.kind) {
     case StreamKind::kPictures:
-        if (!movie.Info().pictures || movie.Info().pictures->index == stream.index)
-            return {};
-        return "one stream of pictures is converted";
+        return chosen.pictures < 0 || chosen.pictures == stream.index ? ""
+                                                                      : "one stream of pictures is converted";
     case StreamKind::kSound:
-        if (format.bHasAudio != 0 && (!movie.Info().sound || movie.Info().sound->index == stream.index))
+        if (format.bHasAudio != 0 && (chosen.sound < 0 || chosen.sound == stream.index))
             return {};
-        return WhySoundStays(movie.Info(), stream, format);
+        return WhySoundStays(source, stream, format);
     case StreamKind::kSubtitles:
         return WhySubtitlesStay(stream, format);
     case StreamKind::kData:
-        if (stream.codec == kChapterTrack && !movie.Info().chapters.empty())
-            return {};
-        return "data streams are not converted";
+        return stream.codec == kChapterTrack && !source.chapters.empty() ? ""
+                                                                         : "data streams are not converted";
     case StreamKind::kCover:
-        if ((traits & kWriterFormatCover) == 0)
-            return fmt::format("{} cannot hold it", NameOf(format));
-        if (hasCover)
-            return "only one cover is carried";
-        hasCover = CarryFile(movie, stream, set);
-        return hasCover ? "" : "it is neither JPEG nor PNG";
+        return (traits & kWriterFormatCover) != 0 ? "" : fmt::format("{} cannot hold it", NameOf(format));
     case StreamKind::kAttachment:
-        if ((traits & kWriterFormatAttachments) == 0)
-            return fmt::format("{} cannot hold it", NameOf(format));
-        return CarryFile(movie, stream, set) ? "" : "it has no name or no content";
+        return (traits & kWriterFormatAttachments) != 0 ? ""
+                                                        : fmt::format("{} cannot hold it", NameOf(format));
     }
     return {};
+}
+
+/// Hands a cover or an attachment that the format can hold to the writer. Empty when it was taken.
+std::string CarryStored(const Movie& movie, const StreamInfo& stream, uint32_t set, bool& hasCover) {
+    if (stream.kind == StreamKind::kAttachment)
+        return CarryFile(movie, stream, set) ? "" : "it has no name or no content";
+    if (stream.kind != StreamKind::kCover)
+        return {};
+    if (hasCover)
+        return "only one cover is carried";
+    hasCover = CarryFile(movie, stream, set);
+    return hasCover ? "" : "it is neither JPEG nor PNG";
+}
+
+std::optional<NotCarried> WhyChaptersStay(const SourceInfo& source, const Request& request,
+                                          const FileFormatInfo& format) {
+    const bool can = (MWGetFormatTraits(format.fccFormat) & kWriterFormatChapters) != 0;
+    if (can || source.chapters.empty() || request.noChapters)
+        return std::nullopt;
+    return NotCarried{"chapters", std::nullopt, {}, {}, fmt::format("{} cannot hold them", NameOf(format))};
+}
+
+/// What the name of a file of subtitles says of its codec.
+std::string UsualTextCodec(const std::string& path) {
+    const std::size_t dot = path.rfind('.');
+    const std::string extension = dot == std::string::npos ? "" : path.substr(dot + 1);
+    return AreAlike(extension, "ass") || AreAlike(extension, "ssa") ? "ass"
+           : AreAlike(extension, "vtt")                             ? "webvtt"
+                                                                    : "subrip";
+}
+
+NotCarried LeftOf(const StreamInfo& stream, std::string reason) {
+    return {std::string(KindName(stream.kind)), stream.index, stream.codec, stream.language,
+            std::move(reason)};
+}
+
+Chosen ChosenOf(const SourceInfo& source, const Request& request) {
+    return {source.pictures ? source.pictures->index : -1, source.sound ? source.sound->index : -1,
+            WantedTracks(source.streams, StreamKind::kSound, request.audioTracks),
+            WantedTracks(source.streams, StreamKind::kSubtitles, request.subtitles)};
 }
 
 } // namespace
@@ -246,24 +292,17 @@ std::vector<NotCarried> CarryOver(Movie& movie, const Request& request, const Fi
     const SourceInfo& source = movie.Info();
     std::vector<NotCarried> left;
     CarryTexts(source, request, writerSet);
-    if (!source.chapters.empty() && !request.noChapters) {
-        const bool can = (MWGetFormatTraits(format.fccFormat) & kWriterFormatChapters) != 0;
-        const int wrong = CarryChapters(source, writerSet);
-        if (!can)
-            left.push_back(
-                {"chapters", std::nullopt, {}, {}, fmt::format("{} cannot hold them", NameOf(format))});
-        else if (wrong != 0)
+    if (std::optional<NotCarried> chapters = WhyChaptersStay(source, request, format))
+        left.push_back(*std::move(chapters));
+    else if (!request.noChapters)
+        if (const int wrong = CarryChapters(source, writerSet); wrong != 0)
             left.push_back(
                 {"chapters", std::nullopt, {}, {}, fmt::format("{} of them have no length", wrong)});
-    }
     FurtherTracks tracks(movie, request, format, writerSet);
     for (const int stream : FurtherSound(source, request, format))
         tracks.AddSound(StreamAt(source, stream));
-    const std::vector<int> wantedSound =
-        WantedTracks(source.streams, StreamKind::kSound, request.audioTracks);
-    const std::vector<int> wantedTexts =
-        WantedTracks(source.streams, StreamKind::kSubtitles, request.subtitles);
-    for (const int stream : wantedTexts)
+    const Chosen chosen = ChosenOf(source, request);
+    for (const int stream : chosen.subtitles)
         if (WhySubtitlesStay(StreamAt(source, stream), format).empty())
             tracks.AddPackets(StreamAt(source, stream));
     for (const SubtitleFileWish& wish : request.subtitleFiles)
@@ -271,17 +310,47 @@ std::vector<NotCarried> CarryOver(Movie& movie, const Request& request, const Fi
             left.push_back(std::move(*stays));
     bool hasCover = false;
     for (const StreamInfo& stream : source.streams) {
-        const bool isUnwanted =
-            (stream.kind == StreamKind::kSound && !IsAmong(wantedSound, stream.index)) ||
-            (stream.kind == StreamKind::kSubtitles && !IsAmong(wantedTexts, stream.index));
-        if (isUnwanted)
+        if (!chosen.Wants(stream))
             continue;
-        std::string reason = ReasonFor(movie, stream, format, writerSet, hasCover);
+        std::string reason = WhyItStays(source, chosen, stream, format);
+        if (reason.empty())
+            reason = CarryStored(movie, stream, writerSet, hasCover);
         if (!reason.empty())
-            left.push_back({std::string(KindName(stream.kind)), stream.index, stream.codec, stream.language,
-                            std::move(reason)});
+            left.push_back(LeftOf(stream, std::move(reason)));
     }
     return left;
+}
+
+std::vector<NotCarried> ForetellLeftBehind(const SourceInfo& source, const Request& request,
+                                           const FileFormatInfo& format) {
+    SourceChoice choice;
+    choice.pictures = !request.noVideo;
+    choice.sound = !request.noAudio;
+    choice.soundTracks = request.audioTracks;
+    try {
+        Chosen chosen = ChosenOf(source, request);
+        const ChosenStreams streams = ChooseStreams(source.streams, choice);
+        chosen.pictures = streams.pictures;
+        chosen.sound = streams.sound;
+        std::vector<NotCarried> left;
+        if (std::optional<NotCarried> chapters = WhyChaptersStay(source, request, format))
+            left.push_back(*std::move(chapters));
+        for (const StreamInfo& stream : source.streams)
+            if (chosen.Wants(stream))
+                if (std::string reason = WhyItStays(source, chosen, stream, format); !reason.empty())
+                    left.push_back(LeftOf(stream, std::move(reason)));
+        for (const SubtitleFileWish& wish : request.subtitleFiles) {
+            StreamInfo stream;
+            stream.kind = StreamKind::kSubtitles;
+            stream.codec = UsualTextCodec(wish.path);
+            if (std::string reason = WhySubtitlesStay(stream, format); !reason.empty())
+                left.push_back({"subtitles", std::nullopt, stream.codec, ThreeLetters(wish.language),
+                                std::move(reason)});
+        }
+        return left;
+    } catch (const SourceError& error) {
+        throw Failure(Category::kRequest, error.what());
+    }
 }
 
 } // namespace movieconv

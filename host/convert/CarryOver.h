@@ -20,6 +20,12 @@ std::vector<int> FurtherSound(const SourceInfo& source, const Request& request, 
 std::vector<NotCarried> CarryOver(Movie& movie, const Request& request, const FileFormatInfo& format,
                                   uint32_t writerSet);
 
+/// What CarryOver is going to leave behind of a source that was looked at, whatever was chosen then. Opens no
+/// file: covers and texts that turn out to be of no use are not among it. Throws Failure when a track that is
+/// asked for is not there.
+std::vector<NotCarried> ForetellLeftBehind(const SourceInfo& source, const Request& request,
+                                           const FileFormatInfo& format);
+
 } // namespace movieconv
 
 #endif

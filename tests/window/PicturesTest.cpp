@@ -1,5 +1,6 @@
 // Real conversions in the window; with a display, pictures of it for people to look at.
 #include "host/window/App.h"
+#include "host/window/model/Words.h"
 #include "host/window/runner/ConvertRunner.h"
 #include "host/window/widgets/Look.h"
 #include "host/window/widgets/QueueView.h"
@@ -160,6 +161,90 @@ TEST_F(PicturesTest, TellsWhatGoesWrongInWords) {
     ASSERT_TRUE(AwaitDone());
     EXPECT_EQ(At(0).state, State::kFailed);
     EXPECT_GT(std::filesystem::file_size(movie), 10'000U);
+}
+
+TEST_F(PicturesTest, CarriesTheTracksThatAreChosen) {
+    WriteFile(folder / "a.srt", "1\n00:00:00,500 --> 00:00:01,500\nGrüße\n");
+    const std::string movie = test_movies::Make("window-tracks.mkv", {"-f",
+                                                                      "lavfi",
+                                                                      "-i",
+                                                                      "testsrc2=s=320x180:r=25",
+                                                                      "-f",
+                                                                      "lavfi",
+                                                                      "-i",
+                                                                      "sine=440",
+                                                                      "-f",
+                                                                      "lavfi",
+                                                                      "-i",
+                                                                      "sine=880",
+                                                                      "-i",
+                                                                      folder / "a.srt",
+                                                                      "-map",
+                                                                      "0",
+                                                                      "-map",
+                                                                      "1",
+                                                                      "-map",
+                                                                      "2",
+                                                                      "-map",
+                                                                      "3",
+                                                                      "-t",
+                                                                      "2",
+                                                                      "-c:v",
+                                                                      "libx264",
+                                                                      "-preset",
+                                                                      "ultrafast",
+                                                                      "-c:a",
+                                                                      "aac",
+                                                                      "-c:s",
+                                                                      "srt",
+                                                                      "-metadata:s:a:0",
+                                                                      "language=eng",
+                                                                      "-metadata:s:a:1",
+                                                                      "language=ger",
+                                                                      "-metadata:s:s:0",
+                                                                      "language=fre"});
+    app.TheQueue().SetNaming({QStringLiteral("{name}"), folder.Path()});
+    app.TheQueue().Add({movie});
+    AwaitExamined(1);
+    ASSERT_EQ(At(0).facts->sounds.size(), 2U);
+    EXPECT_EQ(TrackLine(At(0).facts->sounds[1]), "German (aac, mono)");
+    EXPECT_TRUE(At(0).findings.notes.isEmpty()) << At(0).findings.notes.join("; ").toStdString();
+
+    Wishes wishes;
+    wishes.format = QStringLiteral("flv"); // holds one sound and no subtitles
+    wishes.subtitleFiles = {{folder / "a.srt", QStringLiteral("de")}};
+    app.TheQueue().SetWishes(At(0).id, wishes);
+    AwaitExamined(1);
+    const QString notes = At(0).findings.notes.join(QLatin1Char('\n'));
+    for (const char* told : {"sound 2 (aac, ger)", "subtitles 3 (subrip, fre)", "subtitles (subrip, ger)"})
+        EXPECT_TRUE(notes.contains(QLatin1String(told))) << notes.toStdString();
+    EXPECT_TRUE(At(0).findings.warnings.isEmpty());
+
+    wishes.format = QStringLiteral("mkv");
+    wishes.sounds = QList<int>{At(0).facts->sounds[1].number};
+    wishes.subtitles = QList<int>{};
+    wishes.title = QStringLiteral("Mine");
+    app.TheQueue().SetWishes(At(0).id, wishes);
+    AwaitExamined(1);
+    EXPECT_TRUE(At(0).findings.notes.isEmpty()) << At(0).findings.notes.join("; ").toStdString();
+    app.TheDispatcher().Start();
+    ASSERT_TRUE(AwaitDone());
+    ASSERT_EQ(At(0).state, State::kDone) << At(0).outcome.sentence.toStdString();
+    const MovieFacts made = runner.Look(At(0).target);
+    ASSERT_EQ(made.sounds.size(), 1U);
+    EXPECT_EQ(made.sounds[0].language, "ger");
+    ASSERT_EQ(made.subtitles.size(), 1U);
+    EXPECT_EQ(made.subtitles[0].language, "ger");
+    EXPECT_EQ(made.title, "Mine");
+
+    app.TheQueue().Retry({At(0).id});
+    wishes.sounds = QList<int>{17}; // the file is another one now
+    wishes.subtitleFiles[0].path = folder / "gone.srt";
+    wishes.depth = 10;
+    wishes.format = QStringLiteral("flv");
+    app.TheQueue().SetWishes(At(0).id, wishes);
+    AwaitExamined(1);
+    EXPECT_EQ(At(0).findings.warnings.size(), 2) << At(0).findings.warnings.join("; ").toStdString();
 }
 
 TEST_F(PicturesTest, KeepsWhatTheDecoderSaysInTheLogOfTheMovie) {

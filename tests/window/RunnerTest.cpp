@@ -100,7 +100,6 @@ TEST_F(RunnerTest, AsksTheLibraryForWhatIsWished) {
     wishes.quality = 10;
     wishes.height = 360;
     wishes.deinterlace = Wishes::Deinterlace::kOff;
-    wishes.crop = true;
     wishes.begin = 5;
     wishes.end = 7;
     request = ToRequest(OrderOf(wishes, "out.webm"));
@@ -109,14 +108,51 @@ TEST_F(RunnerTest, AsksTheLibraryForWhatIsWished) {
     EXPECT_EQ(request.size->width, 640);
     EXPECT_EQ(request.size->height, 360);
     EXPECT_EQ(request.deinterlace, movieconv::Deinterlace::kNone);
-    EXPECT_TRUE(request.detectCrop);
     EXPECT_EQ(request.length, 2);
     EXPECT_LT(EstimatedRate(OrderOf(wishes, "out.webm"), request), usual);
+
+    wishes.crop = true; // what is left has another shape, and no borders are to be put back
+    request = ToRequest(OrderOf(wishes, "out.webm"));
+    EXPECT_TRUE(request.detectCrop && !request.size);
+    EXPECT_EQ(request.preferences.fitWithin->height, 360);
+    wishes.cut = Margins{140, 140, 0, 0};
+    request = ToRequest(OrderOf(wishes, "out.webm"));
+    EXPECT_EQ(request.size->width, 864);
+    EXPECT_EQ(request.crop.top + request.crop.bottom, 280);
+    EXPECT_FALSE(request.detectCrop);
 
     EXPECT_TRUE(ToRequest(OrderOf({}, "out.mp3")).noVideo);
     Wishes lost;
     lost.preset = "there is none";
     EXPECT_THROW(ToRequest(OrderOf(lost, "out.mp4")), movieconv::PresetError);
+}
+
+TEST_F(RunnerTest, AsksTheLibraryForTracksAndTexts) {
+    Wishes wishes;
+    movieconv::Request request = ToRequest(OrderOf(wishes, "out.mkv"));
+    EXPECT_FALSE(request.audioTracks || request.subtitles || request.noChapters || request.noMetadata);
+    EXPECT_TRUE(request.metadata.empty() && request.subtitleFiles.empty());
+    wishes.sounds = QList<int>{1, 4};
+    wishes.subtitles = QList<int>{};
+    wishes.subtitleFiles = {{"/s/a.srt", "de"}};
+    wishes.subtitleCharset = "BIG5";
+    wishes.chapters = wishes.texts = false;
+    wishes.title = "Mine";
+    wishes.hdr = Wishes::Hdr::kUsual;
+    wishes.depth = 8;
+    request = ToRequest(OrderOf(wishes, "out.mkv"));
+    EXPECT_EQ(request.audioTracks, (movieconv::TrackList{{"1", "4"}}));
+    ASSERT_TRUE(request.subtitles);
+    EXPECT_TRUE(request.subtitles->empty());
+    ASSERT_EQ(request.subtitleFiles.size(), 1U);
+    EXPECT_EQ(request.subtitleFiles[0].path, "/s/a.srt");
+    EXPECT_EQ(request.subtitleFiles[0].language, "de");
+    EXPECT_EQ(request.subtitleCharset, "BIG5");
+    EXPECT_TRUE(request.noChapters && request.noMetadata);
+    ASSERT_EQ(request.metadata.size(), 1U);
+    EXPECT_EQ(request.metadata[0].key + "=" + request.metadata[0].value, "title=Mine");
+    EXPECT_EQ(request.hdr, movieconv::Hdr::kSdr);
+    EXPECT_EQ(request.depth, 8);
 }
 
 TEST_F(RunnerTest, SavesWishesAsAPresetAndTakesThemBack) {

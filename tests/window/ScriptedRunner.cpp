@@ -110,7 +110,13 @@ MovieFacts ScriptedRunner::Look(const std::string& path) {
     facts.pictureCodec = QStringLiteral("h264");
     facts.sounds = {{1, QStringLiteral("en"), {}, QStringLiteral("aac, stereo")},
                     {2, QStringLiteral("de"), QStringLiteral("Kommentar"), QStringLiteral("aac, stereo")}};
-    facts.subtitles = {{3, QStringLiteral("fr"), {}, QStringLiteral("subrip")}};
+    facts.subtitles = {{3, QStringLiteral("fre"), {}, QStringLiteral("subrip")}};
+    for (int number = 1; number < subtitles; ++number)
+        facts.subtitles.push_back(
+            {3 + number, number == 1 ? QStringLiteral("de") : QStringLiteral("en"), {}, {}});
+    facts.hdr = true;
+    facts.chapters = 2;
+    facts.title = QStringLiteral("A title");
     facts.bytes = 123'456'789;
     return facts;
 }

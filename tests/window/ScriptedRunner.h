@@ -53,6 +53,7 @@ public:
     std::map<std::string, movieconv::window::Wishes> saved; ///< Presets by path.
     Gate looking;                                           ///< Looks at movies pass it.
     std::atomic<int> looks = 0;
+    std::atomic<int> subtitles = 1; ///< How many of them a movie has.
 };
 
 #endif

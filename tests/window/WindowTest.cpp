@@ -21,10 +21,12 @@
 #include <QFileDialog>
 #include <QLabel>
 #include <QLineEdit>
+#include <QMenuBar>
 #include <QMimeData>
 #include <QPushButton>
 #include <QSignalSpy>
 #include <QSlider>
+#include <QSpinBox>
 #include <QToolButton>
 
 #include <set>
@@ -198,17 +200,96 @@ TEST_F(WindowTest, EditsAnEntry) {
     EXPECT_EQ(At(0).wishes.begin, 0);
     Add({"c.mkv"});
     EXPECT_EQ(At(2).wishes.preset, "web"); // the last choice is the next one's
+    EXPECT_EQ(At(2).wishes.begin, 0) << "but for what belongs to one movie";
     EXPECT_EQ(Settings(QString::fromStdString(folder / "settings")).LoadWishes().format, "mp4");
 }
 
-TEST_F(WindowTest, ChoosesTracksAndTarget) {
+TEST_F(WindowTest, ChoosesTracks) {
     Add({"a.mkv"});
-    for (QCheckBox* check : Window().findChildren<QCheckBox*>())
-        if (check->text().contains(QStringLiteral("Kommentar")) ||
-            check->text().contains(QStringLiteral("French")))
-            QTest::keyClick(check, Qt::Key_Space);
+    const auto press = [&](const QString& words) {
+        for (QCheckBox* check : Window().findChildren<QCheckBox*>())
+            if (check->text().contains(words) && check->isVisible())
+                QTest::keyClick(check, Qt::Key_Space);
+    };
+    press("Kommentar");
+    press("French");
     EXPECT_EQ(At(0).wishes.sounds, QList<int>{1});
     EXPECT_EQ(At(0).wishes.subtitles, QList<int>{});
+    press("French");
+    EXPECT_FALSE(At(0).wishes.subtitles) << "all of them";
+    runner.subtitles = 30;
+    Add({"b.mkv"});
+    Select(1);
+    QApplication::processEvents(); // what is new on the page appears
+    for (const bool all : {false, true}) {
+        QTest::mouseClick(Named<QPushButton>(all ? "Subtitles: All" : "Subtitles: None"), Qt::LeftButton);
+        EXPECT_EQ(At(1).wishes.subtitles.has_value(), !all);
+        press("German");
+        ASSERT_TRUE(At(1).wishes.subtitles);
+        EXPECT_EQ(At(1).wishes.subtitles->size(), all ? 29 : 1);
+    }
+    EXPECT_EQ(At(0).wishes.sounds, QList<int>{1}) << "the other movie's";
+}
+
+TEST_F(WindowTest, AddsFilesOfSubtitles) {
+    Add({"a.mkv"});
+    for (const char* name : {"a.de.srt", "a.srt"}) {
+        Click("Add a subtitle file…");
+        auto* dialog = The<QFileDialog>("openSubtitles");
+        EXPECT_FALSE(dialog->isModal());
+        Q_EMIT dialog->filesSelected({QString::fromStdString(folder / name)});
+        delete dialog;
+    }
+    using Files = std::vector<SubtitleFile>;
+    EXPECT_EQ(At(0).wishes.subtitleFiles, (Files{{folder / "a.de.srt", "de"}, {folder / "a.srt", {}}}));
+    auto* language = Named<QComboBox>("Language of a.srt");
+    EXPECT_EQ(language->currentText(), "Language not told");
+    QTest::keyClicks(language, "Fren");
+    EXPECT_EQ(At(0).wishes.subtitleFiles[1].language, "fr");
+    QTest::mouseClick(Named<QToolButton>("Leave a.de.srt out"), Qt::LeftButton);
+    EXPECT_EQ(At(0).wishes.subtitleFiles, (Files{{folder / "a.srt", "fr"}}));
+    Add({"b.mkv"});
+    EXPECT_TRUE(At(1).wishes.subtitleFiles.empty());
+}
+
+TEST_F(WindowTest, ChoosesWhatIsSeldomNeeded) {
+    Add({"a.mkv"});
+    for (QToolButton* button : The<EntryPage>()->findChildren<QToolButton*>())
+        if (button->isCheckable())
+            QTest::mouseClick(button, Qt::LeftButton);
+    for (const char* name : {"Pictures a second", "Sound channels", "Cut into clips", "Deinterlacing", "Crop",
+                             "HDR pictures", "Colour depth"})
+        QTest::keyClick(Named<QComboBox>(name), Qt::Key_Down);
+    const Wishes& wishes = At(0).wishes;
+    EXPECT_EQ(wishes.rate, 60);
+    EXPECT_EQ(wishes.channels, 1);
+    EXPECT_EQ(wishes.clip, 60);
+    EXPECT_EQ(wishes.deinterlace, Wishes::Deinterlace::kOff);
+    EXPECT_TRUE(wishes.crop);
+    EXPECT_EQ(wishes.hdr, Wishes::Hdr::kKeep);
+    EXPECT_EQ(wishes.depth, 8);
+    QTest::keyClick(Named<QComboBox>("Crop"), Qt::Key_Down);
+    auto* above = Named<QSpinBox>("Pixels to cut off: above");
+    EXPECT_TRUE(above->isVisible());
+    above->selectAll();
+    QTest::keyClicks(above, "140");
+    QTest::keyClick(Named<QSpinBox>("Pixels to cut off: left"), Qt::Key_Up);
+    EXPECT_EQ(wishes.cut, (Margins{140, 0, 2, 0}));
+    EXPECT_FALSE(wishes.crop);
+    auto* title = Named<QLineEdit>("Title");
+    EXPECT_EQ(title->text(), "A title");
+    title->selectAll();
+    QTest::keyClicks(title, "Mine");
+    EXPECT_EQ(wishes.title, "Mine");
+    for (QCheckBox* check : Window().findChildren<QCheckBox*>())
+        if (check->text().remove('&').startsWith("Keep"))
+            QTest::keyClick(check, Qt::Key_Space);
+    EXPECT_FALSE(wishes.chapters || wishes.texts);
+    EXPECT_TRUE(wishes.withSound);
+}
+
+TEST_F(WindowTest, ChoosesATarget) {
+    Add({"a.mkv"});
     WriteFile(folder / "there.mp4", "something");
     auto* target = Named<QLineEdit>("File to save as");
     target->selectAll();
@@ -499,6 +580,32 @@ TEST_F(WindowTest, NamesEveryControlForScreenReaders) {
     QStringList nameless;
     Visit(QAccessible::queryAccessibleInterface(The<NamingDialog>()), seen, nameless);
     EXPECT_TRUE(nameless.isEmpty()) << nameless.join("\n").toStdString();
+}
+
+TEST_F(WindowTest, GivesEveryKeyToOneControl) {
+    Add({"a.mkv"});
+    std::map<QString, QStringList> keys;
+    const auto add = [&](const QString& words) {
+        const QString key = QKeySequence::mnemonic(words).toString();
+        if (!key.isEmpty())
+            keys[key] += words;
+    };
+    for (const QAction* action : Window().menuBar()->actions())
+        add(action->text());
+    for (QToolButton* button : The<EntryPage>()->findChildren<QToolButton*>())
+        if (button->isCheckable())
+            button->click();
+    for (QWidget* widget : Window().findChildren<QWidget*>()) {
+        const auto* button = qobject_cast<QAbstractButton*>(widget);
+        const auto* label = qobject_cast<QLabel*>(widget);
+        if (widget->isVisible() && button != nullptr)
+            add(button->text());
+        else if (widget->isVisible() && label != nullptr && label->buddy() != nullptr)
+            add(label->text());
+    }
+    EXPECT_GT(keys.size(), 12U);
+    for (const auto& [key, owners] : keys)
+        EXPECT_EQ(owners.size(), 1) << key.toStdString() << ": " << owners.join(", ").toStdString();
 }
 
 TEST_F(WindowTest, ReachesEveryControlByTab) {

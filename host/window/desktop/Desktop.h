@@ -41,10 +41,9 @@ Q_SIGNALS:
     /// The user chose it.
     void Chosen();
 
-private Q_SLOTS:
-    void OnAction(uint id, const QString& action);
-
 private:
+    Q_SLOT void OnAction(uint id, const QString& action);
+
     uint last_ = 0;
 };
 

@@ -20,7 +20,13 @@ public:
         std::optional<Outcome> outcome;
     };
 
-    Mailbox(Dispatcher& dispatcher, quint64 id) : dispatcher_(dispatcher), id_(id) {}
+    Mailbox(Dispatcher& dispatcher, quint64 id) : dispatcher_(&dispatcher), id_(id) {}
+
+    /// Nobody collects any more: a run may have news for longer than there is a dispatcher.
+    void Close() {
+        const std::lock_guard lock(mutex_);
+        dispatcher_ = nullptr;
+    }
 
     void OnFigures(const Figures& figures) override {
         Put([&](News& news) { news.figures = figures; });
@@ -45,18 +51,20 @@ private:
     template <class Change>
     void Put(Change change) {
         const std::lock_guard lock(mutex_);
+        if (dispatcher_ == nullptr)
+            return;
         change(news_);
         if (posted_)
             return;
         posted_ = true;
         QMetaObject::invokeMethod(
-            &dispatcher_, [&dispatcher = dispatcher_, id = id_] { dispatcher.Collect(id); },
+            dispatcher_, [dispatcher = dispatcher_, id = id_] { dispatcher->Collect(id); },
             Qt::QueuedConnection);
     }
 
-    Dispatcher& dispatcher_;
+    Dispatcher* dispatcher_;
     const quint64 id_;
-    std::mutex mutex_;
+    std::mutex mutex_; // of all but the number
     News news_;
     bool posted_ = false;
 };
@@ -70,8 +78,10 @@ Dispatcher::Dispatcher(Queue& queue, Runner& runner, QObject* parent)
 }
 
 Dispatcher::~Dispatcher() {
-    for (auto& [id, active] : active_)
+    for (auto& [id, active] : active_) {
+        active.mailbox->Close();
         active.run->Stop(); // all of them before the first is waited for
+    }
 }
 
 void Dispatcher::Start() {

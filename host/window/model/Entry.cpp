@@ -1,5 +1,6 @@
 #include "host/window/model/Entry.h"
 
+#include "host/window/model/JsonPath.h"
 #include "text/Path.h"
 
 #include <QJsonArray>
@@ -13,26 +14,17 @@ namespace {
 constexpr std::array<const char*, 6> kStateNames = {"waiting", "active", "done",
                                                     "stopped", "failed", "interrupted"};
 
-/// A path may hold any bytes; JSON may not.
-QString Encode(const std::string& path) {
-    return QString::fromLatin1(QByteArray::fromStdString(path).toPercentEncoding("/ ()[]{},;:+=!&'@#"));
-}
-
-std::string Decode(const QJsonValue& value) {
-    return QByteArray::fromPercentEncoding(value.toString().toLatin1()).toStdString();
-}
-
 QJsonArray EncodeAll(const std::vector<std::string>& paths) {
     QJsonArray array;
     for (const std::string& path : paths)
-        array.append(Encode(path));
+        array.append(EncodePath(path));
     return array;
 }
 
 std::vector<std::string> DecodeAll(const QJsonArray& array) {
     std::vector<std::string> paths;
     for (const QJsonValue& value : array)
-        paths.push_back(Decode(value));
+        paths.push_back(DecodePath(value));
     return paths;
 }
 
@@ -85,8 +77,8 @@ QString NameOf(const std::string& path) {
 
 QJsonObject ToJson(const Entry& entry) {
     QJsonObject json{
-        {QStringLiteral("source"), Encode(entry.source)},
-        {QStringLiteral("target"), Encode(entry.target)},
+        {QStringLiteral("source"), EncodePath(entry.source)},
+        {QStringLiteral("target"), EncodePath(entry.target)},
         {QStringLiteral("state"), QLatin1String(kStateNames.at(static_cast<size_t>(entry.state)))},
         {QStringLiteral("wishes"), ToJson(entry.wishes)}};
     if (entry.targetNamed)
@@ -102,8 +94,8 @@ QJsonObject ToJson(const Entry& entry) {
 
 std::optional<Entry> EntryFromJson(const QJsonObject& json) {
     Entry entry;
-    entry.source = Decode(json[QLatin1String("source")]);
-    entry.target = Decode(json[QLatin1String("target")]);
+    entry.source = DecodePath(json[QLatin1String("source")]);
+    entry.target = DecodePath(json[QLatin1String("target")]);
     const auto state =
         std::find(kStateNames.begin(), kStateNames.end(), json[QLatin1String("state")].toString());
     if (entry.source.empty() || state == kStateNames.end())

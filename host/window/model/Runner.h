@@ -25,6 +25,14 @@ struct TrackFacts {
     QString details; ///< "aac, 5.1, 48 kHz".
 };
 
+/// What a runner knows of a movie beyond the facts, for itself.
+struct OwnKnowledge {
+    OwnKnowledge() = default;
+    OwnKnowledge(const OwnKnowledge&) = delete;
+    OwnKnowledge& operator=(const OwnKnowledge&) = delete;
+    virtual ~OwnKnowledge() = default;
+};
+
 /// What a movie is.
 struct MovieFacts {
     double seconds = 0;
@@ -34,11 +42,14 @@ struct MovieFacts {
     double rate = 0; ///< Pictures a second.
     QString pictureCodec;
     bool interlaced = false;
+    bool hdr = false;
+    int depth = 8; ///< Bits of a colour.
+    QString title; ///< As the movie tells it.
     std::vector<TrackFacts> sounds;
     std::vector<TrackFacts> subtitles;
     int chapters = 0;
-    QStringList leftBehind; ///< What no conversion carries over, a line each.
     int64_t bytes = 0;
+    std::shared_ptr<const OwnKnowledge> own; ///< May be null.
 };
 
 struct FormatFacts {

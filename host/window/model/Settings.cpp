@@ -38,12 +38,7 @@ Wishes Settings::LoadWishes() const {
 
 /// Without what belongs to one movie alone.
 void Settings::Save(const Wishes& wishes) {
-    Wishes general = wishes;
-    general.begin = 0;
-    general.end.reset();
-    general.sounds.reset();
-    general.subtitles.reset();
-    settings_.setValue(kWishes, QJsonDocument(ToJson(general)).toJson(QJsonDocument::Compact));
+    settings_.setValue(kWishes, QJsonDocument(ToJson(ForAnyMovie(wishes))).toJson(QJsonDocument::Compact));
 }
 
 int Settings::LoadAtOnce() const {

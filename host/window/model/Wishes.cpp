@@ -1,11 +1,16 @@
 #include "host/window/model/Wishes.h"
 
+#include "host/window/model/JsonPath.h"
+
 #include <QJsonArray>
+
+#include <algorithm>
 
 namespace movieconv::window {
 namespace {
 
 constexpr double kLongest = 1e7; // seconds, four months
+constexpr int kMostCut = 16384;  // pixels
 
 template <class T>
 void Put(QJsonObject& json, const char* key, const std::optional<T>& value) {
@@ -44,13 +49,74 @@ std::optional<QList<int>> NumbersOf(const QJsonObject& json, const char* key) {
     return numbers;
 }
 
+QJsonArray FilesToJson(const std::vector<SubtitleFile>& files) {
+    QJsonArray array;
+    for (const SubtitleFile& file : files)
+        array.append(QJsonObject{{QStringLiteral("path"), EncodePath(file.path)},
+                                 {QStringLiteral("language"), file.language}});
+    return array;
+}
+
+std::vector<SubtitleFile> SubtitleFilesOf(const QJsonValue& json) {
+    std::vector<SubtitleFile> files;
+    for (const QJsonValue& file : json.toArray()) {
+        const std::string path = DecodePath(file[QLatin1String("path")]);
+        if (!path.empty())
+            files.push_back({path, file[QLatin1String("language")].toString()});
+    }
+    return files;
+}
+
+std::optional<Margins> MarginsOf(const QJsonValue& json) {
+    const QJsonArray sides = json.toArray();
+    if (sides.size() != 4)
+        return std::nullopt;
+    const auto side = [&](int number) { return std::clamp(sides[number].toInt(), 0, kMostCut); };
+    return Margins{side(0), side(1), side(2), side(3)};
+}
+
+QString NameOf(Wishes::Hdr choice) {
+    return choice == Wishes::Hdr::kKeep    ? QStringLiteral("keep")
+           : choice == Wishes::Hdr::kUsual ? QStringLiteral("sdr")
+                                           : QStringLiteral("auto");
+}
+
 QString NameOf(Wishes::Deinterlace choice) {
     return choice == Wishes::Deinterlace::kOff   ? QStringLiteral("off")
            : choice == Wishes::Deinterlace::kAll ? QStringLiteral("all")
                                                  : QStringLiteral("auto");
 }
 
+void PutTexts(QJsonObject& json, const Wishes& wishes) {
+    if (!wishes.subtitleFiles.empty())
+        json[QLatin1String("subtitle_files")] = FilesToJson(wishes.subtitleFiles);
+    if (!wishes.subtitleCharset.isEmpty())
+        json[QLatin1String("subtitle_charset")] = wishes.subtitleCharset;
+    if (!wishes.chapters)
+        json[QLatin1String("chapters")] = false;
+    if (!wishes.texts)
+        json[QLatin1String("texts")] = false;
+    Put(json, "title", wishes.title);
+}
+
 } // namespace
+
+Wishes ForAnyMovie(const Wishes& wishes) {
+    return WithOwn(wishes, Wishes());
+}
+
+Wishes WithOwn(const Wishes& general, const Wishes& own) {
+    Wishes both = general;
+    both.begin = own.begin;
+    both.end = own.end;
+    both.sounds = own.sounds;
+    both.subtitles = own.subtitles;
+    both.subtitleFiles = own.subtitleFiles;
+    both.subtitleCharset = own.subtitleCharset;
+    both.cut = own.cut;
+    both.title = own.title;
+    return both;
+}
 
 QJsonObject ToJson(const Wishes& wishes) {
     const Wishes defaults;
@@ -71,6 +137,13 @@ QJsonObject ToJson(const Wishes& wishes) {
         json[QLatin1String("deinterlace")] = NameOf(wishes.deinterlace);
     if (wishes.crop)
         json[QLatin1String("crop")] = true;
+    if (wishes.cut)
+        json[QLatin1String("cut")] =
+            QJsonArray{wishes.cut->top, wishes.cut->bottom, wishes.cut->left, wishes.cut->right};
+    if (wishes.hdr != defaults.hdr)
+        json[QLatin1String("hdr")] = NameOf(wishes.hdr);
+    Put(json, "depth", wishes.depth);
+    PutTexts(json, wishes);
     if (!wishes.withPictures)
         json[QLatin1String("pictures")] = false;
     if (!wishes.withSound)
@@ -96,6 +169,17 @@ Wishes WishesFromJson(const QJsonObject& json) {
         if (json[QLatin1String("deinterlace")].toString() == NameOf(choice))
             wishes.deinterlace = choice;
     wishes.crop = json[QLatin1String("crop")].toBool(false);
+    wishes.cut = MarginsOf(json[QLatin1String("cut")]);
+    for (const auto choice : {Wishes::Hdr::kKeep, Wishes::Hdr::kUsual})
+        if (json[QLatin1String("hdr")].toString() == NameOf(choice))
+            wishes.hdr = choice;
+    wishes.depth = IntegerOf(json, "depth", 8, 10);
+    wishes.subtitleFiles = SubtitleFilesOf(json[QLatin1String("subtitle_files")]);
+    wishes.subtitleCharset = json[QLatin1String("subtitle_charset")].toString();
+    wishes.chapters = json[QLatin1String("chapters")].toBool(true);
+    wishes.texts = json[QLatin1String("texts")].toBool(true);
+    if (json[QLatin1String("title")].isString())
+        wishes.title = json[QLatin1String("title")].toString();
     wishes.withPictures = json[QLatin1String("pictures")].toBool(true);
     wishes.withSound = json[QLatin1String("sound")].toBool(true);
     return wishes;

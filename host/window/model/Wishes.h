@@ -7,12 +7,33 @@
 #include <QString>
 
 #include <optional>
+#include <string>
+#include <vector>
 
 namespace movieconv::window {
+
+/// A file of subtitles that come into the movie.
+struct SubtitleFile {
+    std::string path;
+    QString language; ///< Of two or three letters; empty when it is not told.
+
+    bool operator==(const SubtitleFile&) const = default;
+};
+
+/// Pixels to cut off.
+struct Margins {
+    int top = 0;
+    int bottom = 0;
+    int left = 0;
+    int right = 0;
+
+    bool operator==(const Margins&) const = default;
+};
 
 /// What is not given is left to the preset and to the source.
 struct Wishes {
     enum class Deinterlace { kAuto, kOff, kAll };
+    enum class Hdr { kAuto, kKeep, kUsual };
 
     QString preset = QStringLiteral("standard");
     std::optional<QString> format;       ///< A file name's extension, "mkv".
@@ -24,14 +45,28 @@ struct Wishes {
     std::optional<double> clip;          ///< Seconds of each clip.
     std::optional<QList<int>> sounds;    ///< Numbers of sound tracks, as the source counts them.
     std::optional<QList<int>> subtitles; ///< Numbers of subtitle tracks.
-    std::optional<int> channels;         ///< 1 or 2.
+    std::vector<SubtitleFile> subtitleFiles;
+    QString subtitleCharset;     ///< Of these files; empty: what they look like.
+    std::optional<int> channels; ///< 1 or 2.
     Deinterlace deinterlace = Deinterlace::kAuto;
-    bool crop = false; ///< Cut black borders off.
+    bool crop = false;          ///< Cut black borders off.
+    std::optional<Margins> cut; ///< Cut that off instead.
+    Hdr hdr = Hdr::kAuto;
+    std::optional<int> depth;     ///< Bits of a colour, 8 or 10.
+    bool chapters = true;         ///< Carry them over.
+    bool texts = true;            ///< Carry the movie's texts over: title, date and so on.
+    std::optional<QString> title; ///< Instead of the movie's own; empty: none.
     bool withPictures = true;
     bool withSound = true;
 
     bool operator==(const Wishes&) const = default;
 };
+
+/// Without what belongs to one movie alone, such as its range and its tracks.
+Wishes ForAnyMovie(const Wishes& wishes);
+
+/// `general`, with what belongs to one movie alone from `own`.
+Wishes WithOwn(const Wishes& general, const Wishes& own);
 
 /// Only what differs from the defaults.
 QJsonObject ToJson(const Wishes& wishes);

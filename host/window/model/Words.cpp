@@ -1,5 +1,7 @@
 #include "host/window/model/Words.h"
 
+#include "host/window/model/Languages.h"
+
 #include <QCoreApplication>
 #include <QLocale>
 #include <QStringList>
@@ -107,9 +109,8 @@ QString FactsLine(const MovieFacts& facts) {
 
 QString TrackLine(const TrackFacts& track) {
     QStringList parts;
-    const QString language = QLocale::languageToString(QLocale(track.language).language());
     if (!track.language.isEmpty())
-        parts += QLocale(track.language).language() == QLocale::C ? track.language : language;
+        parts += LanguageName(track.language);
     if (!track.title.isEmpty())
         parts += track.title;
     if (parts.isEmpty())

@@ -1,5 +1,8 @@
 #include "host/window/runner/ConvertRunner.h"
 
+#include "host/convert/CarryOver.h"
+#include "host/convert/CodecPlan.h"
+#include "host/convert/EncodePlan.h"
 #include "host/convert/Formats.h"
 #include "host/convert/Job.h"
 #include "host/convert/Room.h"
@@ -191,29 +194,83 @@ TrackFacts TrackOf(const StreamInfo& stream) {
     return track;
 }
 
-/// The pictures beside those that a conversion takes, a line each.
-QStringList LeftBehind(const SourceInfo& info) {
-    QStringList left;
-    for (const StreamInfo& stream : info.streams)
-        if (stream.kind == StreamKind::kPictures && info.pictures && stream.index != info.pictures->index)
-            left += Texts::tr("Pictures: %1").arg(TrackLine(TrackOf(stream)));
-    return left;
+struct SourceKnowledge : OwnKnowledge {
+    SourceInfo info;
+};
+
+/// The value of a text of the movie's; empty when there is none.
+QString TextOf(const SourceInfo& info, const char* key) {
+    for (const Tag& tag : info.tags)
+        if (tag.key == key)
+            return QString::fromStdString(tag.value);
+    return {};
 }
 
-/// What the order's file cannot hold of the movie, a line each.
-QStringList LeftBehind(const Order& order) {
-    QStringList left = order.facts.leftBehind;
-    const FileFormatInfo* format = FindFormatOfFile(order.target);
-    if (order.facts.sounds.size() > 1 && order.wishes.withSound && format != nullptr &&
-        !HoldsSeveralTracks(*format))
-        left += Texts::tr("all sound tracks but one");
-    return left;
+void AddPictures(MovieFacts& facts, const PictureStreamInfo& pictures) {
+    facts.width = pictures.width;
+    facts.height = pictures.height;
+    facts.rate = pictures.frameRate;
+    facts.pictureCodec = QString::fromStdString(pictures.codec);
+    facts.interlaced = pictures.interlaced;
+    facts.hdr = IsHdr(pictures);
+    facts.depth = pictures.depth;
+}
+
+void WarnOfTarget(Findings& findings, const Order& order) {
+    namespace fs = std::filesystem;
+    std::error_code unknown;
+    findings.targetExists = fs::exists(fs::symlink_status(order.target, unknown));
+    if (findings.targetExists && fs::equivalent(order.source, order.target, unknown))
+        findings.warnings +=
+            Texts::tr("The new file cannot take the place of its source. Choose another name.");
+    else if (findings.targetExists && !order.replace)
+        findings.warnings += Texts::tr("There is a file of this name already.");
+    else if (findings.targetExists)
+        findings.warnings += Texts::tr("The file that exists will be replaced.");
+}
+
+/// What the library is going to refuse, and what it is going to leave behind.
+void WarnOfContent(Findings& findings, const Order& order, const Request& request) {
+    std::error_code unknown;
+    for (const SubtitleFileWish& file : request.subtitleFiles)
+        if (!std::filesystem::is_regular_file(file.path, unknown))
+            findings.warnings += Texts::tr("The subtitles “%1” were not found.").arg(Readable(file.path));
+    const auto* known = dynamic_cast<const SourceKnowledge*>(order.facts.own.get());
+    if (known == nullptr)
+        return;
+    try {
+        const FileFormatInfo& format = ChooseFormat(request);
+        if (known->info.pictures && !request.noVideo)
+            PlanPictures(request, format, *known->info.pictures);
+        QStringList left;
+        for (const NotCarried& what : ForetellLeftBehind(known->info, request, format))
+            left += LineOf(what);
+        if (!left.isEmpty())
+            findings.notes +=
+                Texts::tr("Not carried over:") + QStringLiteral("\n• ") + left.join(QStringLiteral("\n• "));
+    } catch (const Failure& failure) {
+        findings.warnings += Sentence(failure.Text());
+    }
+}
+
+void WarnOfRoom(Findings& findings, const Order& order, const Request& request, const std::string& folder) {
+    const double seconds = request.length.value_or(order.facts.seconds - request.begin);
+    findings.needed = static_cast<int64_t>(seconds * EstimatedRate(order, request) / 8);
+    const int64_t free = FreeBytes(folder);
+    if (free < 0)
+        return;
+    findings.free = free;
+    if (free < *findings.needed) {
+        findings.warnings += Texts::tr("About %1 are needed, but only %2 are free in “%3”.")
+                                 .arg(BytesText(*findings.needed), BytesText(free), Readable(folder));
+    }
 }
 
 } // namespace
 
 Abilities ConvertRunner::Can() {
     Abilities abilities;
+    abilities.tracks = true;
     abilities.deinterlace = true;
     abilities.crop = true;
     abilities.presetFiles = true;
@@ -267,18 +324,17 @@ MovieFacts ConvertRunner::Look(const std::string& path) {
     try {
         Request request;
         request.input = path;
-        const SourceInfo info = LookAtSource(request);
+        const auto known = std::make_shared<SourceKnowledge>();
+        known->info = LookAtSource(request);
+        const SourceInfo& info = known->info;
         MovieFacts facts;
+        facts.own = known;
         facts.seconds = info.duration;
         facts.lengthKnown = info.certainty != Certainty::kGuessed;
         facts.bytes = info.bytes;
-        if (info.pictures) {
-            facts.width = info.pictures->width;
-            facts.height = info.pictures->height;
-            facts.rate = info.pictures->frameRate;
-            facts.pictureCodec = QString::fromStdString(info.pictures->codec);
-            facts.interlaced = info.pictures->interlaced;
-        }
+        facts.title = TextOf(info, "title");
+        if (info.pictures)
+            AddPictures(facts, *info.pictures);
         for (const StreamInfo& stream : info.streams) {
             if (stream.kind == StreamKind::kSound)
                 facts.sounds.push_back(TrackOf(stream));
@@ -286,7 +342,6 @@ MovieFacts ConvertRunner::Look(const std::string& path) {
                 facts.subtitles.push_back(TrackOf(stream));
         }
         facts.chapters = static_cast<int>(info.chapters.size());
-        facts.leftBehind = LeftBehind(info);
         return facts;
     } catch (const Failure& failure) {
         throw std::runtime_error(Sentence(failure.Text()).toStdString());
@@ -294,38 +349,20 @@ MovieFacts ConvertRunner::Look(const std::string& path) {
 }
 
 Findings ConvertRunner::Check(const Order& order) {
-    namespace fs = std::filesystem;
     Findings findings;
     std::error_code unknown;
     const std::string folder = text::FolderOf(order.target);
-    findings.targetExists = fs::exists(fs::symlink_status(order.target, unknown));
-    if (findings.targetExists && fs::equivalent(order.source, order.target, unknown))
-        findings.warnings +=
-            Texts::tr("The new file cannot take the place of its source. Choose another name.");
-    else if (findings.targetExists && !order.replace)
-        findings.warnings += Texts::tr("There is a file of this name already.");
-    else if (findings.targetExists)
-        findings.warnings += Texts::tr("The file that exists will be replaced.");
-    if (const QStringList left = LeftBehind(order); !left.isEmpty())
-        findings.notes += Texts::tr("Not carried over: %1").arg(left.join(QStringLiteral("; ")));
-    if (!fs::is_directory(folder, unknown)) {
+    WarnOfTarget(findings, order);
+    if (!std::filesystem::is_directory(folder, unknown)) {
         findings.warnings += Texts::tr("There is no folder “%1”.").arg(Readable(folder));
         return findings;
     }
     try {
         const Request request = ToRequest(order);
-        const double seconds = request.length.value_or(order.facts.seconds - request.begin);
-        findings.needed = static_cast<int64_t>(seconds * EstimatedRate(order, request) / 8);
+        WarnOfContent(findings, order, request);
+        WarnOfRoom(findings, order, request, folder);
     } catch (const PresetError& error) {
         findings.warnings += Sentence(error.what());
-        return findings;
-    }
-    if (const int64_t free = FreeBytes(folder); free >= 0) {
-        findings.free = free;
-        if (free < *findings.needed) {
-            findings.warnings += Texts::tr("About %1 are needed, but only %2 are free in “%3”.")
-                                     .arg(BytesText(*findings.needed), BytesText(free), Readable(folder));
-        }
     }
     return findings;
 }

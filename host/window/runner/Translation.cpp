@@ -12,11 +12,14 @@ namespace movieconv::window {
 namespace {
 
 constexpr int kNiceness = 10; // lest the window waits for a processor
-constexpr int kMiddle = 50;   // of the window's scale of quality
+constexpr int kWidest = 32768;
+constexpr int kMiddle = 50; // of the window's scale of quality
 
-Size ScaledTo(int height, const MovieFacts& facts) {
+/// In the shape of what is left when `cut` is cut off.
+Size ScaledTo(int height, const MovieFacts& facts, const Margins& cut) {
     const int even = height / 2 * 2;
-    const double width = static_cast<double>(facts.width) * even / std::max(facts.height, 1);
+    const double width = static_cast<double>(facts.width - cut.left - cut.right) * even /
+                         std::max(facts.height - cut.top - cut.bottom, 1);
     return {std::max(2, static_cast<int>(std::lround(width / 2)) * 2), even};
 }
 
@@ -24,6 +27,31 @@ Deinterlace ToLibrary(Wishes::Deinterlace choice) {
     return choice == Wishes::Deinterlace::kOff   ? Deinterlace::kNone
            : choice == Wishes::Deinterlace::kAll ? Deinterlace::kAll
                                                  : Deinterlace::kFlagged;
+}
+
+Hdr ToLibrary(Wishes::Hdr choice) {
+    return choice == Wishes::Hdr::kKeep ? Hdr::kKeep : choice == Wishes::Hdr::kUsual ? Hdr::kSdr : Hdr::kAuto;
+}
+
+TrackList ToLibrary(const std::optional<QList<int>>& numbers) {
+    if (!numbers)
+        return std::nullopt;
+    std::vector<std::string> list;
+    for (const int number : *numbers)
+        list.push_back(std::to_string(number));
+    return list;
+}
+
+void AskForTracksAndTexts(Request& request, const Wishes& wishes) {
+    request.audioTracks = ToLibrary(wishes.sounds);
+    request.subtitles = ToLibrary(wishes.subtitles);
+    for (const SubtitleFile& file : wishes.subtitleFiles)
+        request.subtitleFiles.push_back({file.path, file.language.toStdString()});
+    request.subtitleCharset = wishes.subtitleCharset.toStdString();
+    request.noChapters = !wishes.chapters;
+    request.noMetadata = !wishes.texts;
+    if (wishes.title)
+        request.metadata.push_back({"title", wishes.title->toStdString()});
 }
 
 /// The codec that the request comes to; nothing when the format cannot carry it, which the library tells.
@@ -39,16 +67,21 @@ void AskForPictures(Request& request, const FileFormatInfo& format, const Preset
                     const Order& order) {
     const Wishes& wishes = order.wishes;
     const MovieFacts& facts = order.facts;
-    if (wishes.height && *wishes.height != facts.height)
-        request.size = ScaledTo(*wishes.height, facts);
+    if (wishes.height && wishes.crop && !wishes.cut) // the shape is not known yet
+        request.preferences.fitWithin = {kWidest, *wishes.height};
+    else if (wishes.height && *wishes.height != facts.height)
+        request.size = ScaledTo(*wishes.height, facts, wishes.cut.value_or(Margins{}));
     request.frameRate = wishes.rate;
     request.deinterlace = ToLibrary(wishes.deinterlace);
-    request.detectCrop = wishes.crop;
+    request.detectCrop = wishes.crop && !wishes.cut;
+    if (wishes.cut)
+        request.crop = {wishes.cut->top, wishes.cut->bottom, wishes.cut->left, wishes.cut->right};
+    request.hdr = ToLibrary(wishes.hdr);
+    request.depth = wishes.depth;
     if (!wishes.quality)
         return;
     if (const std::optional<uint32_t> codec = CodecOf(request, format))
-        request.quality =
-            QualityOf(preset, *codec, request.size ? request.size->height : facts.height, *wishes.quality);
+        request.quality = QualityOf(preset, *codec, wishes.height.value_or(facts.height), *wishes.quality);
 }
 
 } // namespace
@@ -70,6 +103,7 @@ Request ToRequest(const Order& order) {
     request.noVideo = !wishes.withPictures || order.facts.width == 0;
     request.noAudio = !wishes.withSound;
     request.channels = wishes.channels;
+    AskForTracksAndTexts(request, wishes);
     const FileFormatInfo* format = FindFormatOfFile(order.target);
     if (format == nullptr && wishes.format)
         format = FindFormat(wishes.format->toStdString());

@@ -44,16 +44,12 @@
         <translation>Etwa %1 werden gebraucht, aber nur %2 sind in „%3“ frei.</translation>
     </message>
     <message>
-        <source>Pictures: %1</source>
-        <translation>Bilder: %1</translation>
+        <source>The subtitles “%1” were not found.</source>
+        <translation>Die Untertitel „%1“ wurden nicht gefunden.</translation>
     </message>
     <message>
-        <source>Not carried over: %1</source>
-        <translation>Nicht übernommen: %1</translation>
-    </message>
-    <message>
-        <source>all sound tracks but one</source>
-        <translation>alle Tonspuren außer einer</translation>
+        <source>Not carried over:</source>
+        <translation>Nicht übernommen:</translation>
     </message>
 </context>
 <context>
@@ -80,6 +76,161 @@
     <message>
         <source>The queue cannot be saved in %1: %2. It will be lost when the program ends.</source>
         <translation>Die Warteschlange kann nicht in %1 gespeichert werden: %2. Sie geht mit dem Ende des Programms verloren.</translation>
+    </message>
+</context>
+<context>
+    <name>Languages</name>
+    <message>
+        <source>Arabic</source>
+        <translation>Arabisch</translation>
+    </message>
+    <message>
+        <source>Bulgarian</source>
+        <translation>Bulgarisch</translation>
+    </message>
+    <message>
+        <source>Catalan</source>
+        <translation>Katalanisch</translation>
+    </message>
+    <message>
+        <source>Czech</source>
+        <translation>Tschechisch</translation>
+    </message>
+    <message>
+        <source>Danish</source>
+        <translation>Dänisch</translation>
+    </message>
+    <message>
+        <source>German</source>
+        <translation>Deutsch</translation>
+    </message>
+    <message>
+        <source>Greek</source>
+        <translation>Griechisch</translation>
+    </message>
+    <message>
+        <source>English</source>
+        <translation>Englisch</translation>
+    </message>
+    <message>
+        <source>Spanish</source>
+        <translation>Spanisch</translation>
+    </message>
+    <message>
+        <source>Estonian</source>
+        <translation>Estnisch</translation>
+    </message>
+    <message>
+        <source>Persian</source>
+        <translation>Persisch</translation>
+    </message>
+    <message>
+        <source>Finnish</source>
+        <translation>Finnisch</translation>
+    </message>
+    <message>
+        <source>French</source>
+        <translation>Französisch</translation>
+    </message>
+    <message>
+        <source>Hebrew</source>
+        <translation>Hebräisch</translation>
+    </message>
+    <message>
+        <source>Hindi</source>
+        <translation>Hindi</translation>
+    </message>
+    <message>
+        <source>Croatian</source>
+        <translation>Kroatisch</translation>
+    </message>
+    <message>
+        <source>Hungarian</source>
+        <translation>Ungarisch</translation>
+    </message>
+    <message>
+        <source>Indonesian</source>
+        <translation>Indonesisch</translation>
+    </message>
+    <message>
+        <source>Italian</source>
+        <translation>Italienisch</translation>
+    </message>
+    <message>
+        <source>Japanese</source>
+        <translation>Japanisch</translation>
+    </message>
+    <message>
+        <source>Korean</source>
+        <translation>Koreanisch</translation>
+    </message>
+    <message>
+        <source>Lithuanian</source>
+        <translation>Litauisch</translation>
+    </message>
+    <message>
+        <source>Latvian</source>
+        <translation>Lettisch</translation>
+    </message>
+    <message>
+        <source>Dutch</source>
+        <translation>Niederländisch</translation>
+    </message>
+    <message>
+        <source>Norwegian</source>
+        <translation>Norwegisch</translation>
+    </message>
+    <message>
+        <source>Polish</source>
+        <translation>Polnisch</translation>
+    </message>
+    <message>
+        <source>Portuguese</source>
+        <translation>Portugiesisch</translation>
+    </message>
+    <message>
+        <source>Romanian</source>
+        <translation>Rumänisch</translation>
+    </message>
+    <message>
+        <source>Russian</source>
+        <translation>Russisch</translation>
+    </message>
+    <message>
+        <source>Slovak</source>
+        <translation>Slowakisch</translation>
+    </message>
+    <message>
+        <source>Slovenian</source>
+        <translation>Slowenisch</translation>
+    </message>
+    <message>
+        <source>Serbian</source>
+        <translation>Serbisch</translation>
+    </message>
+    <message>
+        <source>Swedish</source>
+        <translation>Schwedisch</translation>
+    </message>
+    <message>
+        <source>Thai</source>
+        <translation>Thailändisch</translation>
+    </message>
+    <message>
+        <source>Turkish</source>
+        <translation>Türkisch</translation>
+    </message>
+    <message>
+        <source>Ukrainian</source>
+        <translation>Ukrainisch</translation>
+    </message>
+    <message>
+        <source>Vietnamese</source>
+        <translation>Vietnamesisch</translation>
+    </message>
+    <message>
+        <source>Chinese</source>
+        <translation>Chinesisch</translation>
     </message>
 </context>
 <context>
@@ -306,20 +457,12 @@
         <translation>Wie in der Vorlage</translation>
     </message>
     <message>
-        <source>P&amp;reset</source>
-        <translation>Vo&amp;rlage</translation>
-    </message>
-    <message>
         <source>&amp;File format</source>
-        <translation>Datei&amp;format</translation>
+        <translation>Da&amp;teiformat</translation>
     </message>
     <message>
         <source>Picture &amp;size</source>
         <translation>Bild&amp;größe</translation>
-    </message>
-    <message>
-        <source>&amp;Quality</source>
-        <translation>&amp;Qualität</translation>
     </message>
     <message>
         <source>Quality</source>
@@ -354,10 +497,6 @@
         <translation>v&amp;on</translation>
     </message>
     <message>
-        <source>t&amp;o</source>
-        <translation>b&amp;is</translation>
-    </message>
-    <message>
         <source>Sound tracks</source>
         <translation>Tonspuren</translation>
     </message>
@@ -378,10 +517,6 @@
         <translation>Zurück zu den Namensregeln</translation>
     </message>
     <message>
-        <source>C&amp;hoose…</source>
-        <translation>&amp;Wählen …</translation>
-    </message>
-    <message>
         <source>Choose the file to save as</source>
         <translation>Die Datei wählen, in die gespeichert wird</translation>
     </message>
@@ -394,56 +529,8 @@
         <translation>Die vorhandene Datei ers&amp;etzen</translation>
     </message>
     <message>
-        <source>&amp;More</source>
-        <translation>&amp;Mehr</translation>
-    </message>
-    <message>
-        <source>Shows or hides the settings that are seldom needed</source>
-        <translation>Zeigt oder verbirgt, was selten gebraucht wird</translation>
-    </message>
-    <message>
-        <source>Cut &amp;black borders off</source>
-        <translation>&amp;Schwarze Ränder abschneiden</translation>
-    </message>
-    <message>
-        <source>P&amp;ictures</source>
-        <translation>B&amp;ilder</translation>
-    </message>
-    <message>
-        <source>Soun&amp;d</source>
-        <translation>&amp;Ton</translation>
-    </message>
-    <message>
-        <source>Pictures a seco&amp;nd</source>
-        <translation>Bilder je Seku&amp;nde</translation>
-    </message>
-    <message>
-        <source>Sound c&amp;hannels</source>
-        <translation>Ton&amp;kanäle</translation>
-    </message>
-    <message>
-        <source>Cut into c&amp;lips</source>
-        <translation>In C&amp;lips teilen</translation>
-    </message>
-    <message>
-        <source>Writes several files, each of that length.</source>
-        <translation>Schreibt mehrere Dateien von dieser Länge.</translation>
-    </message>
-    <message>
-        <source>Deinterlac&amp;e</source>
-        <translation>&amp;Zeilensprung entfernen</translation>
-    </message>
-    <message>
-        <source>Repairs the combs of old television pictures.</source>
-        <translation>Beseitigt die Kammstreifen alter Fernsehbilder.</translation>
-    </message>
-    <message>
-        <source>Convert</source>
-        <translation>Umwandeln</translation>
-    </message>
-    <message>
         <source>&amp;Use for all that wait</source>
-        <translation>Für alle &amp;Wartenden verwenden</translation>
+        <translation>Für &amp;alle Wartenden verwenden</translation>
     </message>
     <message>
         <source>Gives every waiting movie these settings; ranges and tracks stay as they are.</source>
@@ -451,11 +538,7 @@
     </message>
     <message>
         <source>Sa&amp;ve as preset…</source>
-        <translation>Als &amp;Vorlage speichern …</translation>
-    </message>
-    <message>
-        <source>Load prese&amp;t…</source>
-        <translation>Vorlage la&amp;den …</translation>
+        <translation>Als Vorlage &amp;speichern …</translation>
     </message>
     <message>
         <source>As the source</source>
@@ -464,37 +547,6 @@
     <message>
         <source>%1 lines</source>
         <translation>%1 Zeilen</translation>
-    </message>
-    <message>
-        <source>Mono</source>
-        <translation>Mono</translation>
-    </message>
-    <message>
-        <source>Stereo</source>
-        <translation>Stereo</translation>
-    </message>
-    <message>
-        <source>No, one file</source>
-        <translation>Nein, eine Datei</translation>
-    </message>
-    <message numerus="yes">
-        <source>Of %n minutes</source>
-        <translation>
-            <numerusform>Von einer Minute</numerusform>
-            <numerusform>Von %n Minuten</numerusform>
-        </translation>
-    </message>
-    <message>
-        <source>Where the source says so</source>
-        <translation>Wo die Quelle es angibt</translation>
-    </message>
-    <message>
-        <source>Never</source>
-        <translation>Nie</translation>
-    </message>
-    <message>
-        <source>Everything</source>
-        <translation>Alles</translation>
     </message>
     <message>
         <source>Looking at it…</source>
@@ -527,6 +579,30 @@
     <message>
         <source>Notes</source>
         <translation>Hinweise</translation>
+    </message>
+    <message>
+        <source>&amp;Preset</source>
+        <translation>Vo&amp;rlage</translation>
+    </message>
+    <message>
+        <source>Qualit&amp;y</source>
+        <translation>&amp;Qualität</translation>
+    </message>
+    <message>
+        <source>&amp;to</source>
+        <translation>b&amp;is</translation>
+    </message>
+    <message>
+        <source>Choos&amp;e…</source>
+        <translation>Wäh&amp;len …</translation>
+    </message>
+    <message>
+        <source>&amp;Load preset…</source>
+        <translation>&amp;Vorlage laden …</translation>
+    </message>
+    <message>
+        <source>Preset</source>
+        <translation>Vorlage</translation>
     </message>
 </context>
 <context>
@@ -843,7 +919,7 @@
     </message>
     <message>
         <source>A&amp;dd movies…</source>
-        <translation>Filme hin&amp;zufügen …</translation>
+        <translation>Filme hinz&amp;ufügen …</translation>
     </message>
     <message>
         <source>Pause</source>
@@ -864,6 +940,184 @@
     <message>
         <source>Converts all movies that wait</source>
         <translation>Wandelt alle wartenden Filme um</translation>
+    </message>
+</context>
+<context>
+    <name>movieconv::window::MoreSettings</name>
+    <message>
+        <source>M&amp;ore</source>
+        <translation>&amp;Mehr</translation>
+    </message>
+    <message>
+        <source>Shows or hides the settings that are seldom needed</source>
+        <translation>Zeigt oder verbirgt, was selten gebraucht wird</translation>
+    </message>
+    <message>
+        <source>No title</source>
+        <translation>Kein Titel</translation>
+    </message>
+    <message>
+        <source>Pictures</source>
+        <translation>Bilder</translation>
+    </message>
+    <message>
+        <source>Sound</source>
+        <translation>Ton</translation>
+    </message>
+    <message>
+        <source>&amp;Keep the chapters</source>
+        <translation>&amp;Kapitel behalten</translation>
+    </message>
+    <message>
+        <source>Pictures a seco&amp;nd</source>
+        <translation>Bilder je Seku&amp;nde</translation>
+    </message>
+    <message>
+        <source>Sound channels</source>
+        <translation>Tonkanäle</translation>
+    </message>
+    <message>
+        <source>Cut &amp;into clips</source>
+        <translation>In &amp;Clips teilen</translation>
+    </message>
+    <message>
+        <source>Writes several files, each of that length.</source>
+        <translation>Schreibt mehrere Dateien von dieser Länge.</translation>
+    </message>
+    <message>
+        <source>Deinterlacin&amp;g</source>
+        <translation>Zeilens&amp;prung entfernen</translation>
+    </message>
+    <message>
+        <source>Repairs the combs of old television pictures.</source>
+        <translation>Beseitigt die Kammstreifen alter Fernsehbilder.</translation>
+    </message>
+    <message>
+        <source>HDR pictures</source>
+        <translation>HDR-Bilder</translation>
+    </message>
+    <message>
+        <source>Pictures with more light and colour than usual displays have.</source>
+        <translation>Bilder mit mehr Licht und Farbe, als übliche Bildschirme zeigen.</translation>
+    </message>
+    <message>
+        <source>Colour depth</source>
+        <translation>Farbtiefe</translation>
+    </message>
+    <message>
+        <source>Title</source>
+        <translation>Titel</translation>
+    </message>
+    <message>
+        <source>What players show as the movie&apos;s name.</source>
+        <translation>Was Abspielprogramme als Namen des Films zeigen.</translation>
+    </message>
+    <message>
+        <source>Characters of the subtitle files</source>
+        <translation>Zeichen der Untertiteldateien</translation>
+    </message>
+    <message>
+        <source>Convert</source>
+        <translation>Umwandeln</translation>
+    </message>
+    <message>
+        <source>Crop</source>
+        <translation>Beschneiden</translation>
+    </message>
+    <message>
+        <source>above</source>
+        <translation>oben</translation>
+    </message>
+    <message>
+        <source>below</source>
+        <translation>unten</translation>
+    </message>
+    <message>
+        <source>left</source>
+        <translation>links</translation>
+    </message>
+    <message>
+        <source>right</source>
+        <translation>rechts</translation>
+    </message>
+    <message>
+        <source>Pixels to cut off: %1</source>
+        <translation>Abzuschneidende Bildpunkte: %1</translation>
+    </message>
+    <message>
+        <source>As the source</source>
+        <translation>Wie die Quelle</translation>
+    </message>
+    <message>
+        <source>As the preset has it</source>
+        <translation>Wie in der Vorlage</translation>
+    </message>
+    <message>
+        <source>Mono</source>
+        <translation>Mono</translation>
+    </message>
+    <message>
+        <source>Stereo</source>
+        <translation>Stereo</translation>
+    </message>
+    <message>
+        <source>No, one file</source>
+        <translation>Nein, eine Datei</translation>
+    </message>
+    <message numerus="yes">
+        <source>Of %n minutes</source>
+        <translation>
+            <numerusform>Von einer Minute</numerusform>
+            <numerusform>Von %n Minuten</numerusform>
+        </translation>
+    </message>
+    <message>
+        <source>Where the source says so</source>
+        <translation>Wo die Quelle es angibt</translation>
+    </message>
+    <message>
+        <source>Never</source>
+        <translation>Nie</translation>
+    </message>
+    <message>
+        <source>Everything</source>
+        <translation>Alles</translation>
+    </message>
+    <message>
+        <source>Nothing</source>
+        <translation>Nichts</translation>
+    </message>
+    <message>
+        <source>Black borders</source>
+        <translation>Schwarze Ränder</translation>
+    </message>
+    <message>
+        <source>By hand</source>
+        <translation>Von Hand</translation>
+    </message>
+    <message>
+        <source>Kept where the format can</source>
+        <translation>Bleiben, wo das Format es kann</translation>
+    </message>
+    <message>
+        <source>Kept</source>
+        <translation>Bleiben</translation>
+    </message>
+    <message>
+        <source>Made usual pictures</source>
+        <translation>Werden übliche Bilder</translation>
+    </message>
+    <message>
+        <source>%1 bits</source>
+        <translation>%1 Bit</translation>
+    </message>
+    <message>
+        <source>What they look like</source>
+        <translation>Wonach sie aussehen</translation>
+    </message>
+    <message>
+        <source>Keep title, date and other texts</source>
+        <translation>Titel, Datum und andere Te&amp;xte behalten</translation>
     </message>
 </context>
 <context>
@@ -1043,6 +1297,52 @@
     <message>
         <source>The machine may go to sleep while movies are converted: %1</source>
         <translation>Der Rechner könnte während der Umwandlung einschlafen: %1</translation>
+    </message>
+</context>
+<context>
+    <name>movieconv::window::SubtitleFiles</name>
+    <message>
+        <source>&amp;Add a subtitle file…</source>
+        <translation>Untertitel&amp;datei hinzufügen …</translation>
+    </message>
+    <message>
+        <source>Language of %1</source>
+        <translation>Sprache von %1</translation>
+    </message>
+    <message>
+        <source>Language not told</source>
+        <translation>Sprache unbekannt</translation>
+    </message>
+    <message>
+        <source>Leave this file out</source>
+        <translation>Diese Datei weglassen</translation>
+    </message>
+    <message>
+        <source>Leave %1 out</source>
+        <translation>%1 weglassen</translation>
+    </message>
+    <message>
+        <source>Add subtitles</source>
+        <translation>Untertitel hinzufügen</translation>
+    </message>
+    <message>
+        <source>Subtitles</source>
+        <translation>Untertitel</translation>
+    </message>
+    <message>
+        <source>All files</source>
+        <translation>Alle Dateien</translation>
+    </message>
+</context>
+<context>
+    <name>movieconv::window::TrackChoice</name>
+    <message>
+        <source>All</source>
+        <translation>Alle</translation>
+    </message>
+    <message>
+        <source>None</source>
+        <translation>Keine</translation>
     </message>
 </context>
 <context>

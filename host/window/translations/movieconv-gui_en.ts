@@ -29,16 +29,6 @@
     </message>
 </context>
 <context>
-    <name>movieconv::window::EntryPage</name>
-    <message numerus="yes">
-        <source>Of %n minutes</source>
-        <translation>
-            <numerusform>Of one minute</numerusform>
-            <numerusform>Of %n minutes</numerusform>
-        </translation>
-    </message>
-</context>
-<context>
     <name>movieconv::window::LogPanel</name>
     <message numerus="yes">
         <source>&amp;Log (%n lines)</source>
@@ -76,6 +66,16 @@
         <translation>
             <numerusform>One movie</numerusform>
             <numerusform>%n movies</numerusform>
+        </translation>
+    </message>
+</context>
+<context>
+    <name>movieconv::window::MoreSettings</name>
+    <message numerus="yes">
+        <source>Of %n minutes</source>
+        <translation>
+            <numerusform>Of one minute</numerusform>
+            <numerusform>Of %n minutes</numerusform>
         </translation>
     </message>
 </context>

@@ -1,17 +1,17 @@
 #include "host/window/widgets/EntryPage.h"
 
 #include "host/window/model/Words.h"
+#include "host/window/widgets/FormParts.h"
 #include "host/window/widgets/Icons.h"
 #include "host/window/widgets/Look.h"
+#include "host/window/widgets/MoreSettings.h"
 #include "host/window/widgets/RangeStrip.h"
+#include "host/window/widgets/SubtitleFiles.h"
+#include "host/window/widgets/TrackChoice.h"
 
 #include <QApplication>
 #include <QCheckBox>
-#include <QComboBox>
 #include <QFileDialog>
-#include <QFormLayout>
-#include <QGroupBox>
-#include <QLabel>
 #include <QLineEdit>
 #include <QPushButton>
 #include <QScrollArea>
@@ -27,35 +27,13 @@ namespace {
 
 constexpr int kStripWidth = 160; // of one of its pictures, in pixels
 constexpr std::array kHeights = {2160, 1440, 1080, 720, 576, 480, 360};
-constexpr std::array kRates = {60.0, 50.0, 30.0, 25.0, 24.0, 15.0};
-constexpr std::array kClipMinutes = {1, 5, 10, 15, 30, 60};
 
-/// Chooses the item with this data; the first one when there is none.
-void Choose(QComboBox& box, const QVariant& data) {
-    box.setCurrentIndex(std::max(0, box.findData(data)));
-}
-
-template <class T>
-QVariant DataOf(const std::optional<T>& value) {
-    return value ? QVariant(*value) : QVariant();
-}
-
-template <class T>
-std::optional<T> ValueOf(const QComboBox& box) {
-    const QVariant data = box.currentData();
-    return data.isValid() ? std::optional(data.value<T>()) : std::nullopt;
-}
-
-void AddRow(QFormLayout& form, const QString& words, QWidget* field, const QString& description = {}) {
+/// Of a row that grows downwards: its first line stands beside the label.
+QLabel* MakeTopLabel(const QString& words) {
     auto* label = new QLabel(words);
-    label->setBuddy(field);
-    label->setMinimumHeight(field->sizeHint().height()); // in the middle beside it
-    field->setAccessibleName(QString(words).remove(QLatin1Char('&')));
-    if (!description.isEmpty()) {
-        field->setToolTip(description);
-        field->setAccessibleDescription(description);
-    }
-    form.addRow(label, field);
+    label->setAlignment(Qt::AlignRight | Qt::AlignTop);
+    label->setContentsMargins(0, 3, 0, 0);
+    return label;
 }
 
 } // namespace
@@ -77,7 +55,8 @@ EntryPage::EntryPage(Runner& runner, QWidget* parent)
     body->setContentsMargins(0, 0, 0, 0);
     body->setSpacing(14);
     body->addLayout(MakeForm());
-    body->addWidget(MakeMore());
+    more_ = new MoreSettings(abilities_);
+    body->addWidget(more_);
     body->addLayout(MakeFoot());
     scroll->setWidget(page);
     auto* outer = new QVBoxLayout(this);
@@ -92,10 +71,10 @@ EntryPage::~EntryPage() = default;
 
 QLayout* EntryPage::MakeHead() {
     title_ = MakeTitle({}, 1.5, true);
-    title_->setWordWrap(true);
     facts_ = MakeHint();
     unusable_ = new QLabel;
     unusable_->setWordWrap(true);
+    unusable_->setMinimumWidth(1); // a long path is cut and does not widen the page
     unusable_->setTextFormat(Qt::PlainText);
     unusable_->setAccessibleName(tr("Why it cannot be converted"));
     auto* head = new QVBoxLayout;
@@ -122,15 +101,19 @@ QFormLayout* EntryPage::MakeForm() {
     form->setVerticalSpacing(10);
     form->setFieldGrowthPolicy(QFormLayout::AllNonFixedFieldsGrow);
     form->setLabelAlignment(Qt::AlignRight | Qt::AlignVCenter);
-    AddRow(*form, tr("P&reset"), preset_);
-    form->addRow(QString(), description_);
+    auto* preset = new QVBoxLayout;
+    preset->setSpacing(4);
+    preset->addWidget(preset_);
+    preset->addWidget(description_);
+    preset_->setAccessibleName(tr("Preset"));
+    form->addRow(MakeRowLabel(tr("&Preset"), preset_), preset);
     AddRow(*form, tr("&File format"), format_);
     AddRow(*form, tr("Picture &size"), size_);
     auto* quality = new QHBoxLayout;
     quality->setSpacing(14);
     quality->addWidget(quality_, 1);
     quality->addWidget(qualityWords_);
-    auto* label = new QLabel(tr("&Quality"));
+    auto* label = new QLabel(tr("Qualit&y"));
     label->setBuddy(quality_);
     quality_->setAccessibleName(tr("Quality"));
     quality_->setToolTip(tr("To the left small files, to the right good pictures."));
@@ -138,7 +121,8 @@ QFormLayout* EntryPage::MakeForm() {
     form->addRow(label, quality);
     form->addRow(new QLabel(tr("Range")), MakeRange());
     AddTracks(form);
-    form->addRow(new QLabel(tr("Save as")), MakeTarget());
+    QWidget* target = MakeTarget();
+    form->addRow(MakeRowLabel(tr("Save as"), browse_), target);
     return form;
 }
 
@@ -156,7 +140,7 @@ QWidget* EntryPage::MakeRange() {
     auto* times = new QHBoxLayout;
     auto* from = new QLabel(tr("f&rom"));
     from->setBuddy(begin_);
-    auto* to = new QLabel(tr("t&o"));
+    auto* to = new QLabel(tr("&to"));
     to->setBuddy(end_);
     times->addWidget(from);
     times->addWidget(begin_);
@@ -173,18 +157,19 @@ QWidget* EntryPage::MakeRange() {
 }
 
 void EntryPage::AddTracks(QFormLayout* form) {
-    sounds_ = new QGroupBox;
-    subtitles_ = new QGroupBox;
-    for (QGroupBox* box : {sounds_, subtitles_}) {
-        box->setFlat(true);
-        auto* layout = new QVBoxLayout(box);
-        layout->setContentsMargins(0, 0, 0, 0);
-        layout->setSpacing(4);
-    }
-    sounds_->setAccessibleName(tr("Sound tracks"));
-    subtitles_->setAccessibleName(tr("Subtitles"));
-    form->addRow(new QLabel(tr("Sound tracks")), sounds_);
-    form->addRow(new QLabel(tr("Subtitles")), subtitles_);
+    sounds_ = new TrackChoice(tr("Sound tracks"));
+    subtitles_ = new TrackChoice(tr("Subtitles"));
+    subtitleFiles_ = new SubtitleFiles;
+    auto* texts = new QWidget;
+    auto* layout = new QVBoxLayout(texts);
+    layout->setContentsMargins(0, 0, 0, 0);
+    layout->setSpacing(6);
+    layout->addWidget(subtitles_);
+    layout->addWidget(subtitleFiles_);
+    soundsLabel_ = MakeTopLabel(tr("Sound tracks"));
+    subtitlesLabel_ = MakeTopLabel(tr("Subtitles"));
+    form->addRow(soundsLabel_, sounds_);
+    form->addRow(subtitlesLabel_, texts);
 }
 
 QWidget* EntryPage::MakeTarget() {
@@ -194,10 +179,11 @@ QWidget* EntryPage::MakeTarget() {
     target_->setClearButtonEnabled(true);
     for (QToolButton* clear : target_->findChildren<QToolButton*>())
         clear->setAccessibleName(tr("Back to the naming rules"));
-    browse_ = new QPushButton(IconOf(Sign::kFolder), tr("C&hoose…"));
+    browse_ = new QPushButton(IconOf(Sign::kFolder), tr("Choos&e…"));
     browse_->setAccessibleName(tr("Choose the file to save as"));
     findings_ = new QLabel;
     findings_->setWordWrap(true);
+    findings_->setMinimumWidth(1);
     findings_->setTextFormat(Qt::PlainText);
     findings_->setAccessibleName(tr("Warnings"));
     notes_ = MakeHint();
@@ -217,56 +203,12 @@ QWidget* EntryPage::MakeTarget() {
     return target;
 }
 
-QWidget* EntryPage::MakeMore() {
-    more_ = new QToolButton;
-    more_->setText(tr("&More"));
-    more_->setCheckable(true);
-    more_->setAutoRaise(true);
-    more_->setArrowType(Qt::RightArrow);
-    more_->setToolButtonStyle(Qt::ToolButtonTextBesideIcon);
-    more_->setAccessibleDescription(tr("Shows or hides the settings that are seldom needed"));
-    rate_ = new QComboBox;
-    channels_ = new QComboBox;
-    deinterlace_ = new QComboBox;
-    crop_ = new QCheckBox(tr("Cut &black borders off"));
-    clip_ = new QComboBox;
-    pictures_ = new QCheckBox(tr("P&ictures"));
-    sound_ = new QCheckBox(tr("Soun&d"));
-    auto* rest = new QWidget;
-    auto* form = new QFormLayout(rest);
-    form->setContentsMargins(20, 0, 0, 0);
-    form->setHorizontalSpacing(16);
-    AddRow(*form, tr("Pictures a seco&nd"), rate_);
-    AddRow(*form, tr("Sound c&hannels"), channels_);
-    AddRow(*form, tr("Cut into c&lips"), clip_, tr("Writes several files, each of that length."));
-    AddRow(*form, tr("Deinterlac&e"), deinterlace_, tr("Repairs the combs of old television pictures."));
-    auto* streams = new QHBoxLayout;
-    streams->addWidget(pictures_);
-    streams->addWidget(sound_);
-    streams->addStretch();
-    form->addRow(new QLabel(tr("Convert")), streams);
-    form->addRow(QString(), crop_);
-    form->setRowVisible(deinterlace_, abilities_.deinterlace);
-    form->setRowVisible(crop_, abilities_.crop);
-    rest->hide();
-    connect(more_, &QToolButton::toggled, rest, [this, rest](bool open) {
-        more_->setArrowType(open ? Qt::DownArrow : Qt::RightArrow);
-        rest->setVisible(open);
-    });
-    auto* more = new QWidget;
-    auto* layout = new QVBoxLayout(more);
-    layout->setContentsMargins(0, 0, 0, 0);
-    layout->addWidget(more_);
-    layout->addWidget(rest);
-    return more;
-}
-
 QLayout* EntryPage::MakeFoot() {
     auto* all = new QPushButton(tr("&Use for all that wait"));
     all->setToolTip(tr("Gives every waiting movie these settings; ranges and tracks stay as they are."));
     all->setAccessibleDescription(all->toolTip());
     auto* save = new QPushButton(tr("Sa&ve as preset…"));
-    auto* load = new QPushButton(tr("Load prese&t…"));
+    auto* load = new QPushButton(tr("&Load preset…"));
     for (QPushButton* button : {save, load})
         button->setVisible(abilities_.presetFiles);
     connect(all, &QPushButton::clicked, this, [this] { Q_EMIT AllWanted(entry_.wishes); });
@@ -296,18 +238,6 @@ void EntryPage::FillChoices() {
     size_->addItem(tr("As the source"));
     for (const int height : kHeights)
         size_->addItem(tr("%1 lines").arg(height), height);
-    rate_->addItem(tr("As the source"));
-    for (const double rate : kRates)
-        rate_->addItem(QLocale().toString(rate, 'g', 4), rate);
-    channels_->addItem(tr("As the preset has it"));
-    channels_->addItem(tr("Mono"), 1);
-    channels_->addItem(tr("Stereo"), 2);
-    clip_->addItem(tr("No, one file"));
-    for (const int minutes : kClipMinutes)
-        clip_->addItem(tr("Of %n minutes", "", minutes), minutes * 60.0);
-    deinterlace_->addItem(tr("Where the source says so"), static_cast<int>(Wishes::Deinterlace::kAuto));
-    deinterlace_->addItem(tr("Never"), static_cast<int>(Wishes::Deinterlace::kOff));
-    deinterlace_->addItem(tr("Everything"), static_cast<int>(Wishes::Deinterlace::kAll));
 }
 
 void EntryPage::Connect() {
@@ -322,25 +252,19 @@ void EntryPage::Connect() {
             [this] { Choose([this](Wishes& wishes) { wishes.format = ValueOf<QString>(*format_); }); });
     connect(size_, &QComboBox::activated, this,
             [this] { Choose([this](Wishes& wishes) { wishes.height = ValueOf<int>(*size_); }); });
-    connect(rate_, &QComboBox::activated, this,
-            [this] { Choose([this](Wishes& wishes) { wishes.rate = ValueOf<double>(*rate_); }); });
-    connect(channels_, &QComboBox::activated, this,
-            [this] { Choose([this](Wishes& wishes) { wishes.channels = ValueOf<int>(*channels_); }); });
-    connect(clip_, &QComboBox::activated, this,
-            [this] { Choose([this](Wishes& wishes) { wishes.clip = ValueOf<double>(*clip_); }); });
-    connect(deinterlace_, &QComboBox::activated, this, [this] {
-        Choose([this](Wishes& wishes) {
-            wishes.deinterlace = static_cast<Wishes::Deinterlace>(deinterlace_->currentData().toInt());
-        });
-    });
     connect(quality_, &QSlider::valueChanged, this,
             [this](int value) { Choose([value](Wishes& wishes) { wishes.quality = value; }); });
-    connect(crop_, &QCheckBox::toggled, this,
-            [this](bool on) { Choose([on](Wishes& wishes) { wishes.crop = on; }); });
-    connect(pictures_, &QCheckBox::toggled, this,
-            [this](bool on) { Choose([on](Wishes& wishes) { wishes.withPictures = on; }); });
-    connect(sound_, &QCheckBox::toggled, this,
-            [this](bool on) { Choose([on](Wishes& wishes) { wishes.withSound = on; }); });
+    connect(sounds_, &TrackChoice::Chosen, this, [this](const std::optional<QList<int>>& numbers) {
+        Choose([&](Wishes& wishes) { wishes.sounds = numbers; });
+    });
+    connect(subtitles_, &TrackChoice::Chosen, this, [this](const std::optional<QList<int>>& numbers) {
+        Choose([&](Wishes& wishes) { wishes.subtitles = numbers; });
+    });
+    connect(subtitleFiles_, &SubtitleFiles::Chosen, this, [this](const std::vector<SubtitleFile>& files) {
+        Choose([&](Wishes& wishes) { wishes.subtitleFiles = files; });
+    });
+    connect(more_, &MoreSettings::Chosen, this,
+            [this](const Wishes& chosen) { Choose([&](Wishes& wishes) { wishes = chosen; }); });
     connect(strip_, &RangeStrip::RangeChosen, this, [this](double begin, std::optional<double> end) {
         Choose([&](Wishes& wishes) {
             wishes.begin = begin;
@@ -365,7 +289,7 @@ void EntryPage::Show(const Entry& entry) {
     const bool found = entry.facts.has_value() && (other || !entry_.facts);
     entry_ = entry;
     filling_ = true;
-    title_->setText(NameOf(entry.source).simplified());
+    SetTitle(*title_, NameOf(entry.source).simplified());
     facts_->setText(entry.facts ? FactsLine(*entry.facts) : tr("Looking at it…"));
     facts_->setVisible(entry.facts || entry.unusable.isEmpty());
     unusable_->setText(entry.unusable);
@@ -376,24 +300,23 @@ void EntryPage::Show(const Entry& entry) {
         AskForPictures();
     }
     ShowWishes();
-    ShowMore();
     ShowFindings();
     filling_ = false;
 }
 
 void EntryPage::ShowWishes() {
     const Wishes& wishes = entry_.wishes;
-    window::Choose(*preset_, wishes.preset);
+    ChooseItem(*preset_, wishes.preset);
     const PresetFacts* preset = CurrentPreset();
     description_->setText(preset != nullptr ? preset->description : QString());
     format_->setItemText(0, preset != nullptr ? tr("The preset's (.%1)").arg(preset->extension)
                                               : tr("The preset's"));
-    window::Choose(*format_, DataOf(wishes.format));
+    ChooseItem(*format_, DataOf(wishes.format));
     size_->setItemText(0,
                        entry_.facts && entry_.facts->width > 0
                            ? tr("As the source (%1 × %2)").arg(entry_.facts->width).arg(entry_.facts->height)
                            : tr("As the source"));
-    window::Choose(*size_, DataOf(wishes.height));
+    ChooseItem(*size_, DataOf(wishes.height));
     const int usual = preset != nullptr ? preset->quality : -1;
     quality_->setEnabled(usual >= 0);
     quality_->setValue(wishes.quality.value_or(std::max(usual, 0)));
@@ -405,22 +328,24 @@ void EntryPage::ShowWishes() {
     const double length = entry_.facts ? entry_.facts->seconds : 0;
     begin_->setText(ClockText(wishes.begin));
     end_->setText(wishes.end ? ClockText(*wishes.end) : length > 0 ? ClockText(length) : QString());
-    ShowTracks(sounds_, entry_.facts && abilities_.tracks ? entry_.facts->sounds : std::vector<TrackFacts>(),
-               wishes.sounds);
-    ShowTracks(subtitles_,
-               entry_.facts && abilities_.tracks ? entry_.facts->subtitles : std::vector<TrackFacts>(),
-               wishes.subtitles);
+    ShowTracks();
+    more_->Show(wishes, entry_.facts ? &*entry_.facts : nullptr);
 }
 
-void EntryPage::ShowMore() {
-    const Wishes& wishes = entry_.wishes;
-    window::Choose(*rate_, DataOf(wishes.rate));
-    window::Choose(*channels_, DataOf(wishes.channels));
-    window::Choose(*clip_, DataOf(wishes.clip));
-    window::Choose(*deinterlace_, static_cast<int>(wishes.deinterlace));
-    crop_->setChecked(wishes.crop);
-    pictures_->setChecked(wishes.withPictures);
-    sound_->setChecked(wishes.withSound);
+void EntryPage::ShowTracks() {
+    const bool known = entry_.facts && abilities_.tracks;
+    const std::vector<TrackFacts> none;
+    const std::vector<TrackFacts>& sounds = known ? entry_.facts->sounds : none;
+    const std::vector<TrackFacts>& subtitles = known ? entry_.facts->subtitles : none;
+    sounds_->Show(sounds, entry_.wishes.sounds);
+    sounds_->setVisible(!sounds.empty());
+    sounds_->setEnabled(entry_.wishes.withSound);
+    soundsLabel_->setVisible(!sounds.empty());
+    subtitles_->Show(subtitles, entry_.wishes.subtitles);
+    subtitles_->setVisible(!subtitles.empty());
+    subtitleFiles_->Show(entry_.wishes.subtitleFiles, entry_.source);
+    subtitleFiles_->setVisible(known);
+    subtitlesLabel_->setVisible(known);
 }
 
 void EntryPage::ShowFindings() {
@@ -438,43 +363,6 @@ void EntryPage::ShowFindings() {
     unusable_->setPalette(colours);
     replace_->setChecked(entry_.replace);
     replace_->setVisible(entry_.findings.targetExists);
-}
-
-void EntryPage::ShowTracks(QGroupBox* box, const std::vector<TrackFacts>& tracks,
-                           const std::optional<QList<int>>& chosen) {
-    const QList<QCheckBox*> old = box->findChildren<QCheckBox*>();
-    bool same = static_cast<size_t>(old.size()) == tracks.size();
-    for (qsizetype i = 0; same && i < old.size(); ++i)
-        same = old[i]->text() == TrackLine(tracks[static_cast<size_t>(i)]);
-    if (!same) {
-        qDeleteAll(old);
-        for (const TrackFacts& track : tracks) {
-            auto* check = new QCheckBox(TrackLine(track));
-            check->setProperty("number", track.number);
-            connect(check, &QCheckBox::toggled, this, [this] {
-                Choose([this](Wishes& wishes) {
-                    wishes.sounds = ChosenTracks(sounds_);
-                    wishes.subtitles = ChosenTracks(subtitles_);
-                });
-            });
-            box->layout()->addWidget(check);
-        }
-    }
-    for (QCheckBox* check : box->findChildren<QCheckBox*>())
-        check->setChecked(!chosen || chosen->contains(check->property("number").toInt()));
-    // The row goes with its label.
-    if (auto* form = qobject_cast<QFormLayout*>(body_->layout()->itemAt(0)->layout()))
-        form->setRowVisible(box, !tracks.empty());
-}
-
-/// Nothing when all are.
-std::optional<QList<int>> EntryPage::ChosenTracks(const QGroupBox* box) const {
-    QList<int> numbers;
-    const QList<QCheckBox*> checks = box->findChildren<QCheckBox*>();
-    for (const QCheckBox* check : checks)
-        if (check->isChecked())
-            numbers.append(check->property("number").toInt());
-    return numbers.size() == checks.size() ? std::nullopt : std::optional(numbers);
 }
 
 void EntryPage::AskForPictures() {

@@ -10,7 +10,6 @@
 class QCheckBox;
 class QComboBox;
 class QFormLayout;
-class QGroupBox;
 class QLabel;
 class QLineEdit;
 class QPushButton;
@@ -19,7 +18,10 @@ class QToolButton;
 
 namespace movieconv::window {
 
+class MoreSettings;
 class RangeStrip;
+class SubtitleFiles;
+class TrackChoice;
 
 class EntryPage : public QWidget {
     Q_OBJECT
@@ -45,17 +47,13 @@ private:
     QFormLayout* MakeForm();
     QWidget* MakeRange();
     QWidget* MakeTarget();
-    QWidget* MakeMore();
     QLayout* MakeFoot();
     void AddTracks(QFormLayout* form);
     void Connect();
     void FillChoices();
     void ShowWishes();
-    void ShowMore();
     void ShowFindings();
-    void ShowTracks(QGroupBox* box, const std::vector<TrackFacts>& tracks,
-                    const std::optional<QList<int>>& chosen);
-    std::optional<QList<int>> ChosenTracks(const QGroupBox* box) const;
+    void ShowTracks();
     void AskForPictures();
     void Choose(const std::function<void(Wishes&)>& change);
     void ChooseTimes();
@@ -81,21 +79,17 @@ private:
     RangeStrip* strip_;
     QLineEdit* begin_;
     QLineEdit* end_;
-    QGroupBox* sounds_;
-    QGroupBox* subtitles_;
+    QLabel* soundsLabel_;
+    TrackChoice* sounds_;
+    QLabel* subtitlesLabel_;
+    TrackChoice* subtitles_;
+    SubtitleFiles* subtitleFiles_;
     QLineEdit* target_;
     QPushButton* browse_;
     QLabel* findings_;
     QLabel* notes_;
     QCheckBox* replace_;
-    QToolButton* more_;
-    QComboBox* rate_;
-    QComboBox* channels_;
-    QComboBox* deinterlace_;
-    QCheckBox* crop_;
-    QComboBox* clip_;
-    QCheckBox* pictures_;
-    QCheckBox* sound_;
+    MoreSettings* more_;
     Worker worker_; // last: its tasks refer to the rest
 };
 

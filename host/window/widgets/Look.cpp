@@ -4,6 +4,7 @@
 #include <QEvent>
 #include <QLabel>
 #include <QPainter>
+#include <QStyleOption>
 
 #include <algorithm>
 
@@ -99,6 +100,27 @@ QLabel* MakeTitle(const QString& text, double scale, bool strong) {
     return label;
 }
 
+/// Names seldom have spaces: a line may end behind any sign, and after so many letters.
+void SetTitle(QLabel& title, const QString& name) {
+    constexpr int kLongestWord = 24;
+    const QChar kBreak(0x200B); // a space without width
+    QString shown;
+    int word = 0;
+    for (const QChar letter : name) {
+        shown += letter;
+        word = letter.isLetterOrNumber() && !letter.isHighSurrogate() ? word + 1 : 0;
+        if (!letter.isLetterOrNumber() && !letter.isSurrogate() && !letter.isMark())
+            shown += kBreak;
+        else if (word >= kLongestWord) {
+            shown += kBreak;
+            word = 0;
+        }
+    }
+    title.setText(shown);
+    title.setWordWrap(true);
+    title.setAccessibleName(name);
+}
+
 QLabel* MakeHint(const QString& text) {
     auto* label = new Hint(text);
     label->setWordWrap(true);
@@ -176,6 +198,31 @@ QSize OwnStyle::sizeFromContents(ContentsType type, const QStyleOption* option, 
     default:
         return plain;
     }
+}
+
+/// The style's own leaves hardly any room between a button's sign and its words.
+void OwnStyle::drawControl(ControlElement element, const QStyleOption* option, QPainter* painter,
+                           const QWidget* widget) const {
+    const auto* button = qstyleoption_cast<const QStyleOptionButton*>(option);
+    if (element != CE_PushButtonLabel || button == nullptr || button->icon.isNull() ||
+        button->text.isEmpty()) {
+        QProxyStyle::drawControl(element, option, painter, widget);
+        return;
+    }
+    constexpr int kGap = 8;
+    const QSize icon = button->iconSize;
+    const int flags = Qt::TextShowMnemonic | Qt::AlignVCenter;
+    const int words = button->fontMetrics.size(Qt::TextShowMnemonic, button->text).width();
+    const bool enabled = (button->state & State_Enabled) != 0;
+    QRect place = button->rect;
+    place.setLeft(place.left() + std::max(0, (place.width() - icon.width() - kGap - words) / 2));
+    const QRect iconPlace(place.left(), place.center().y() - icon.height() / 2 + 1, icon.width(),
+                          icon.height());
+    place.setLeft(iconPlace.right() + 1 + kGap);
+    button->icon.paint(painter, visualRect(button->direction, button->rect, iconPlace), Qt::AlignCenter,
+                       enabled ? QIcon::Normal : QIcon::Disabled);
+    drawItemText(painter, visualRect(button->direction, button->rect, place), flags, button->palette, enabled,
+                 button->text, QPalette::ButtonText);
 }
 
 int OwnStyle::pixelMetric(PixelMetric metric, const QStyleOption* option, const QWidget* widget) const {

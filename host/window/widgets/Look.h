@@ -26,6 +26,8 @@ QPalette OwnPalette(bool dark);
 
 /// A label in a larger, stronger font.
 QLabel* MakeTitle(const QString& text, double scale, bool strong);
+/// Shows a file's name, which may be longer than any line.
+void SetTitle(QLabel& title, const QString& name);
 /// A label for what is said beside something.
 QLabel* MakeHint(const QString& text = {});
 
@@ -57,6 +59,8 @@ public:
     OwnStyle();
     QSize sizeFromContents(ContentsType type, const QStyleOption* option, const QSize& size,
                            const QWidget* widget) const override;
+    void drawControl(ControlElement element, const QStyleOption* option, QPainter* painter,
+                     const QWidget* widget) const override;
     int pixelMetric(PixelMetric metric, const QStyleOption* option, const QWidget* widget) const override;
 };
 

@@ -113,7 +113,7 @@ void MainWindow::Connect() {
     connect(overPage_, &OverPage::FolderWanted, this, &MainWindow::FolderWanted);
     connect(entryPage_, &EntryPage::WishesChosen, this, [this](quint64 id, const Wishes& wishes) {
         queue_.SetWishes(id, wishes);
-        queue_.SetDefaults(wishes);
+        queue_.SetDefaults(ForAnyMovie(wishes));
         settings_.Save(wishes);
     });
     connect(entryPage_, &EntryPage::TargetChosen, &queue_, &Queue::SetTarget);
@@ -213,7 +213,8 @@ void MainWindow::LoadPreset(quint64 id) {
             queue_.FillPresets();
             Wishes wishes;
             wishes.preset = preset.name;
-            queue_.SetWishes(id, wishes);
+            if (const Entry* entry = queue_.Find(id))
+                queue_.SetWishes(id, WithOwn(wishes, entry->wishes));
             ShowEntry();
         } catch (const std::runtime_error& error) {
             Tell(QString::fromUtf8(error.what()));
@@ -227,15 +228,8 @@ void MainWindow::UseForAll(const Wishes& wishes) {
     for (const Entry& entry : queue_.Entries())
         if (entry.state == State::kWaiting)
             ids.append(entry.id);
-    for (const quint64 id : ids) {
-        Wishes theirs = wishes;
-        const Wishes& now = queue_.Find(id)->wishes;
-        theirs.begin = now.begin;
-        theirs.end = now.end;
-        theirs.sounds = now.sounds;
-        theirs.subtitles = now.subtitles;
-        queue_.SetWishes(id, theirs);
-    }
+    for (const quint64 id : ids)
+        queue_.SetWishes(id, WithOwn(wishes, queue_.Find(id)->wishes));
 }
 
 void MainWindow::StartOrGoOn() {

@@ -71,7 +71,7 @@ QString FactsOf(const Entry& entry) {
 OverPage::OverPage(QWidget* parent)
     : QWidget(parent),
       sign_(new QLabel),
-      title_(MakeTitle({}, 1.6, true)),
+      title_(MakeTitle({}, 1.5, true)),
       sentence_(new QLabel),
       facts_(MakeHint()),
       notCarried_(new QLabel),
@@ -81,6 +81,7 @@ OverPage::OverPage(QWidget* parent)
       log_(new LogPanel) {
     for (QLabel* label : {sentence_, notCarried_}) {
         label->setWordWrap(true);
+        label->setMinimumWidth(1); // a long path is cut and does not widen the page
         label->setTextFormat(Qt::PlainText);
         label->setTextInteractionFlags(Qt::TextSelectableByMouse | Qt::TextSelectableByKeyboard);
     }
@@ -90,7 +91,7 @@ OverPage::OverPage(QWidget* parent)
     sign_->setAccessibleName(tr("State"));
 
     auto* layout = new QVBoxLayout(this);
-    layout->setContentsMargins(32, 32, 32, 16);
+    layout->setContentsMargins(24, 20, 24, 16);
     layout->setSpacing(12);
     layout->addWidget(sign_);
     layout->addWidget(title_);
@@ -113,8 +114,7 @@ OverPage::OverPage(QWidget* parent)
 void OverPage::Show(const Entry& entry) {
     shown_ = entry.id;
     sign_->setPixmap(SignPicture(entry.state, palette(), devicePixelRatioF()));
-    title_->setText(QStringLiteral("%1 – %2").arg(NameOf(entry.source).simplified(), TitleOf(entry.state)));
-    title_->setWordWrap(true);
+    SetTitle(*title_, QStringLiteral("%1 – %2").arg(NameOf(entry.source).simplified(), TitleOf(entry.state)));
     const bool hasFile = !entry.outcome.files.empty();
     file_ = hasFile ? Readable(entry.outcome.files.front()) : QString();
     QString sentence = entry.outcome.sentence;

@@ -56,7 +56,7 @@ void PictureView::paintEvent(QPaintEvent*) {
 
 WorkPage::WorkPage(QWidget* parent)
     : QWidget(parent),
-      title_(MakeTitle({}, 1.25, true)),
+      title_(MakeTitle({}, 1.5, true)),
       picture_(new PictureView),
       phase_(MakeHint()),
       percent_(MakeTitle({}, 2.0, true)),
@@ -120,7 +120,7 @@ void WorkPage::Show(const Entry& entry) {
     if (entry.id != shown_) {
         shown_ = entry.id;
         picture_->Show({});
-        title_->setText(NameOf(entry.source).simplified());
+        SetTitle(*title_, NameOf(entry.source).simplified());
     }
     const Figures& figures = entry.figures;
     paused_ = figures.phase == Phase::kPaused;

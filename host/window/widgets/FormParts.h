@@ -1,0 +1,39 @@
+// What the pages' forms are made of.
+#ifndef MOVIECONV_HOST_WINDOW_WIDGETS_FORMPARTS_H
+#define MOVIECONV_HOST_WINDOW_WIDGETS_FORMPARTS_H
+
+#include <QComboBox>
+#include <QFormLayout>
+#include <QLabel>
+#include <QVariant>
+
+#include <algorithm>
+#include <optional>
+
+namespace movieconv::window {
+
+/// Chooses the item with this data; the first one when there is none.
+inline void ChooseItem(QComboBox& box, const QVariant& data) {
+    box.setCurrentIndex(std::max(0, box.findData(data)));
+}
+
+template <class T>
+QVariant DataOf(const std::optional<T>& value) {
+    return value ? QVariant(*value) : QVariant();
+}
+
+template <class T>
+std::optional<T> ValueOf(const QComboBox& box) {
+    const QVariant data = box.currentData();
+    return data.isValid() ? std::optional(data.value<T>()) : std::nullopt;
+}
+
+/// A row whose label names the field, with a key where `words` has one, to screen readers too.
+void AddRow(QFormLayout& form, const QString& words, QWidget* field, const QString& description = {});
+
+/// The label of a row whose field is as high as `field`, in the middle beside it.
+QLabel* MakeRowLabel(const QString& words, QWidget* field);
+
+} // namespace movieconv::window
+
+#endif

@@ -1,0 +1,79 @@
+#include "host/window/widgets/TrackChoice.h"
+
+#include "host/window/model/Words.h"
+
+#include <QCheckBox>
+#include <QHBoxLayout>
+#include <QPushButton>
+
+namespace movieconv::window {
+namespace {
+
+constexpr qsizetype kMany = 4;
+
+} // namespace
+
+TrackChoice::TrackChoice(const QString& name, QWidget* parent)
+    : QWidget(parent), few_(new QWidget), layout_(new QVBoxLayout(this)) {
+    setAccessibleName(name);
+    layout_->setContentsMargins(0, 3, 0, 0); // so that the first one stands beside the row's label
+    layout_->setSpacing(4);
+    auto* row = new QHBoxLayout(few_);
+    row->setContentsMargins(0, 0, 0, 0);
+    for (const bool on : {true, false}) {
+        auto* button = new QPushButton(on ? tr("All") : tr("None"));
+        button->setAccessibleName(QStringLiteral("%1: %2").arg(name, button->text()));
+        connect(button, &QPushButton::clicked, this, [this, on] { TickAll(on); });
+        row->addWidget(button);
+    }
+    row->addStretch();
+    layout_->addWidget(few_);
+}
+
+void TrackChoice::Show(const std::vector<TrackFacts>& tracks, const std::optional<QList<int>>& chosen) {
+    bool same = static_cast<size_t>(checks_.size()) == tracks.size();
+    for (qsizetype i = 0; same && i < checks_.size(); ++i)
+        same = checks_[i]->text() == TrackLine(tracks[static_cast<size_t>(i)]);
+    if (!same)
+        Fill(tracks);
+    filling_ = true;
+    for (qsizetype i = 0; i < checks_.size(); ++i) {
+        const int number = tracks[static_cast<size_t>(i)].number;
+        checks_[i]->setProperty("number", number);
+        checks_[i]->setChecked(!chosen || chosen->contains(number));
+    }
+    filling_ = false;
+}
+
+void TrackChoice::Fill(const std::vector<TrackFacts>& tracks) {
+    qDeleteAll(checks_);
+    checks_.clear();
+    for (const TrackFacts& track : tracks) {
+        auto* check = new QCheckBox(TrackLine(track));
+        connect(check, &QCheckBox::toggled, this, [this] {
+            if (!filling_)
+                Tell();
+        });
+        layout_->insertWidget(static_cast<int>(checks_.size()), check);
+        checks_.append(check);
+    }
+    few_->setVisible(checks_.size() >= kMany);
+}
+
+void TrackChoice::TickAll(bool on) {
+    filling_ = true;
+    for (QCheckBox* check : checks_)
+        check->setChecked(on);
+    filling_ = false;
+    Tell();
+}
+
+void TrackChoice::Tell() {
+    QList<int> numbers;
+    for (const QCheckBox* check : checks_)
+        if (check->isChecked())
+            numbers.append(check->property("number").toInt());
+    Q_EMIT Chosen(numbers.size() == checks_.size() ? std::nullopt : std::optional(numbers));
+}
+
+} // namespace movieconv::window
