@@ -100,9 +100,15 @@ struct WindowTest : testing::Test {
         EXPECT_TRUE(action->isEnabled()) << name;
         action->trigger();
     }
+    /// What has just come into a layout may not have a place yet on which it could be pressed.
+    static void Press(QWidget* button) {
+        ASSERT_NE(button, nullptr);
+        ASSERT_TRUE(Await([&] { return button->isVisible() && !button->size().isEmpty(); }));
+        QTest::mouseClick(button, Qt::LeftButton);
+    }
     void Click(const QString& text) {
         if (QPushButton* button = Button(text))
-            QTest::mouseClick(button, Qt::LeftButton);
+            Press(button);
     }
     void Select(size_t row) { The<QueueView>()->Select(At(row).id); }
     bool AwaitScripts(size_t count) {
@@ -136,7 +142,7 @@ TEST_F(WindowTest, ExplainsItselfWhenItIsEmptyAndOpensFiles) {
     EXPECT_TRUE(The<QPushButton>("openButton")->isVisible());
     EXPECT_FALSE(The<QPushButton>("startButton")->isVisible());
     Movie("a.mkv");
-    QTest::mouseClick(The<QPushButton>("openButton"), Qt::LeftButton);
+    Press(The<QPushButton>("openButton"));
     auto* dialog = The<QFileDialog>("openFiles");
     EXPECT_FALSE(dialog->isModal());
     Q_EMIT dialog->filesSelected({QString::fromStdString(folder / "a.mkv")});
@@ -222,7 +228,7 @@ TEST_F(WindowTest, ChoosesTracks) {
     Select(1);
     QApplication::processEvents(); // what is new on the page appears
     for (const bool all : {false, true}) {
-        QTest::mouseClick(Named<QPushButton>(all ? "Subtitles: All" : "Subtitles: None"), Qt::LeftButton);
+        Press(Named<QPushButton>(all ? "Subtitles: All" : "Subtitles: None"));
         EXPECT_EQ(At(1).wishes.subtitles.has_value(), !all);
         press("German");
         ASSERT_TRUE(At(1).wishes.subtitles);
@@ -246,7 +252,7 @@ TEST_F(WindowTest, AddsFilesOfSubtitles) {
     EXPECT_EQ(language->currentText(), "Language not told");
     QTest::keyClicks(language, "Fren");
     EXPECT_EQ(At(0).wishes.subtitleFiles[1].language, "fr");
-    QTest::mouseClick(Named<QToolButton>("Leave a.de.srt out"), Qt::LeftButton);
+    Press(Named<QToolButton>("Leave a.de.srt out"));
     EXPECT_EQ(At(0).wishes.subtitleFiles, (Files{{folder / "a.srt", "fr"}}));
     Add({"b.mkv"});
     EXPECT_TRUE(At(1).wishes.subtitleFiles.empty());
@@ -256,7 +262,7 @@ TEST_F(WindowTest, ChoosesWhatIsSeldomNeeded) {
     Add({"a.mkv"});
     for (QToolButton* button : The<EntryPage>()->findChildren<QToolButton*>())
         if (button->isCheckable())
-            QTest::mouseClick(button, Qt::LeftButton);
+            Press(button);
     for (const char* name : {"Pictures a second", "Sound channels", "Cut into clips", "Deinterlacing", "Crop",
                              "HDR pictures", "Colour depth"})
         QTest::keyClick(Named<QComboBox>(name), Qt::Key_Down);
@@ -411,13 +417,13 @@ TEST_F(WindowTest, RunsEightMoviesPausesStopsAndTellsTheDiskIsFull) {
     EXPECT_TRUE(app->TheDispatcher().StopsAfterThis());
     Select(2);
     auto* page = The<WorkPage>();
-    QTest::mouseClick(page->findChild<QPushButton*>(QStringLiteral("pauseThis")), Qt::LeftButton);
+    Press(page->findChild<QPushButton*>(QStringLiteral("pauseThis")));
     EXPECT_TRUE(Script(2).paused);
     EXPECT_FALSE(Script(1).paused);
-    QTest::mouseClick(page->findChild<QPushButton*>(QStringLiteral("stopThis")), Qt::LeftButton);
+    Press(page->findChild<QPushButton*>(QStringLiteral("stopThis")));
     ASSERT_TRUE(Await([&] { return At(2).state == State::kStopped; }));
     EXPECT_EQ(At(8).state, State::kWaiting);
-    QTest::mouseClick(The<QPushButton>("stopButton"), Qt::LeftButton);
+    Press(The<QPushButton>("stopButton"));
     ASSERT_TRUE(Await([&] { return !app->TheDispatcher().IsWorking(); }));
     Act("removeOver");
     EXPECT_EQ(app->TheQueue().Entries().size(), 1U);
@@ -472,7 +478,7 @@ TEST_F(WindowTest, OffersWhatWasInterruptedOnceMore) {
     Begin();
     EXPECT_EQ(At(0).state, State::kInterrupted);
     EXPECT_TRUE(Shows<OverPage>());
-    QTest::mouseClick(The<NoticeBar>()->findChild<QPushButton*>(), Qt::LeftButton);
+    Press(The<NoticeBar>()->findChild<QPushButton*>());
     ASSERT_TRUE(AwaitScripts(1));
     EXPECT_EQ(Script(0).order.source, folder / "a.mkv");
 }

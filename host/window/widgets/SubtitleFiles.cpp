@@ -32,7 +32,7 @@ void SubtitleFiles::Show(const std::vector<SubtitleFile>& files, const std::stri
         return;
     files_ = files;
     if (rows_ != nullptr) {
-        rows_->hide();
+        rows_->setParent(nullptr);
         rows_->deleteLater(); // one of its controls may have asked for this
     }
     rows_ = new QWidget;
