@@ -55,7 +55,6 @@ std::string FormatText(const EncodeParam& param) {
     return "\"" + CodeText(param.fccFileFormat) + "\"";
 }
 
-constexpr int kUsualSpeed = 5;
 constexpr std::array kProfiles{"baseline", "main", "high"};
 
 void SetCompression(PictureSettings& settings, const PictureCodec& codec, const WriterOptions& options) {

@@ -53,23 +53,27 @@ constexpr SpeedScale kX26Speeds{"preset", {"veryslow", "slower", "slow", "medium
 constexpr SpeedScale kVpxSpeeds{"cpu-used", {"0", "1", "2", "3", "4", "5", "8"}};
 constexpr SpeedScale kAv1Speeds{"preset", {"2", "4", "6", "8", "10", "11", "12"}};
 
+constexpr std::array<int, 7> kNotAhead{};
+constexpr std::array<int, 7> kX264Ahead{70, 70, 56, 46, 36, 16, 0};
+constexpr std::array<int, 7> kX265Ahead{50, 50, 34, 26, 21, 21, 10};
+
 // Frames encoded side by side can wait for each other for ever at the end; rows still are.
 constexpr const char* kX265Options = "x265-params=log-level=none:frame-threads=1";
 constexpr const char* kVpxOptions = "deadline=good";
 constexpr const char* kFfv1Options = "level=3,g=1,slicecrc=1"; // every picture by itself, with a check sum
 
 constexpr std::array kPictureCodecs{
-    PictureCodec{kXvid,  AV_CODEC_ID_MPEG4,      "mpeg4",      kPlanar,     false, false, 0.0, kQuantiser, kOneSpeed, ""},
-    PictureCodec{kH264,  AV_CODEC_ID_H264,       "libx264",    kPlanar,     false, true,  2.0, kCrf51, kX26Speeds, ""},
-    PictureCodec{kHevc,  AV_CODEC_ID_HEVC,       "libx265",    kPlanar,     true,  true,  0.0, kCrf51, kX26Speeds, kX265Options},
-    PictureCodec{kMjpg,  AV_CODEC_ID_MJPEG,      "mjpeg",      kPlanarFull, false, false, 0.0, kQuantiser, kOneSpeed, ""},
-    PictureCodec{kVp8,   AV_CODEC_ID_VP8,        "libvpx",     kPlanar,     false, false, 1.0, kCapped63, kVpxSpeeds, kVpxOptions},
-    PictureCodec{kVp9,   AV_CODEC_ID_VP9,        "libvpx-vp9", kPlanar,     true,  false, 1.0, kCrf63, kVpxSpeeds, kVpxOptions},
-    PictureCodec{kAv1,   AV_CODEC_ID_AV1,        "libsvtav1",  kPlanar,     true,  true,  0.0, kCrf63, kAv1Speeds, ""},
-    PictureCodec{kFfv1,  AV_CODEC_ID_FFV1,       "ffv1",       kPlanar,     true,  false, 1.0, kNoQuality, kOneSpeed, kFfv1Options},
-    PictureCodec{kMpeg2, AV_CODEC_ID_MPEG2VIDEO, "mpeg2video", kPlanar,     false, false, 0.0, kQuantiser, kOneSpeed, ""},
-    PictureCodec{kFlv1,  AV_CODEC_ID_FLV1,       "flv",        kPlanar,     false, false, 0.0, kQuantiser, kOneSpeed, ""},
-    PictureCodec{kGif,   AV_CODEC_ID_GIF,        "gif",        kPalette,    false, false, 0.0, kNoQuality, kOneSpeed, ""},
+    PictureCodec{kXvid,  AV_CODEC_ID_MPEG4,      "mpeg4",      kPlanar,     false, false, 0.0, kQuantiser, kOneSpeed, kNotAhead, ""},
+    PictureCodec{kH264,  AV_CODEC_ID_H264,       "libx264",    kPlanar,     false, true,  2.0, kCrf51, kX26Speeds, kX264Ahead, ""},
+    PictureCodec{kHevc,  AV_CODEC_ID_HEVC,       "libx265",    kPlanar,     true,  true,  0.0, kCrf51, kX26Speeds, kX265Ahead, kX265Options},
+    PictureCodec{kMjpg,  AV_CODEC_ID_MJPEG,      "mjpeg",      kPlanarFull, false, false, 0.0, kQuantiser, kOneSpeed, kNotAhead, ""},
+    PictureCodec{kVp8,   AV_CODEC_ID_VP8,        "libvpx",     kPlanar,     false, false, 1.0, kCapped63, kVpxSpeeds, kNotAhead, kVpxOptions},
+    PictureCodec{kVp9,   AV_CODEC_ID_VP9,        "libvpx-vp9", kPlanar,     true,  false, 1.0, kCrf63, kVpxSpeeds, kNotAhead, kVpxOptions},
+    PictureCodec{kAv1,   AV_CODEC_ID_AV1,        "libsvtav1",  kPlanar,     true,  true,  0.0, kCrf63, kAv1Speeds, kNotAhead, ""},
+    PictureCodec{kFfv1,  AV_CODEC_ID_FFV1,       "ffv1",       kPlanar,     true,  false, 1.0, kNoQuality, kOneSpeed, kNotAhead, kFfv1Options},
+    PictureCodec{kMpeg2, AV_CODEC_ID_MPEG2VIDEO, "mpeg2video", kPlanar,     false, false, 0.0, kQuantiser, kOneSpeed, kNotAhead, ""},
+    PictureCodec{kFlv1,  AV_CODEC_ID_FLV1,       "flv",        kPlanar,     false, false, 0.0, kQuantiser, kOneSpeed, kNotAhead, ""},
+    PictureCodec{kGif,   AV_CODEC_ID_GIF,        "gif",        kPalette,    false, false, 0.0, kNoQuality, kOneSpeed, kNotAhead, ""},
 };
 
 // The limits of AAC are the format's (6144 bits for a frame of 1024 samples), those of the others their encoders'.

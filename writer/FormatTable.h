@@ -34,6 +34,8 @@ struct SpeedScale {
     std::array<const char*, 7> values; ///< From the slowest.
 };
 
+constexpr int kUsualSpeed = 5; ///< On the scale of WriterOptions, where none is chosen.
+
 /// A codec for pictures.
 struct PictureCodec {
     uint32_t code;
@@ -46,7 +48,10 @@ struct PictureCodec {
     /// their number, never on timing.
     double threads;
     QualityScale quality;
-    SpeedScale speed;    ///< An encoder that has one has to be told how far key frames may lie apart.
+    SpeedScale speed; ///< An encoder that has one has to be told how far key frames may lie apart.
+    /// Pictures that the encoder takes before it gives the packet of an earlier one, at most, by the speed.
+    /// 0: none, or it cannot be told after which picture to cut.
+    std::array<int, 7> looksAhead;
     const char* options; ///< For the encoder in any case, as "name=value,...".
 };
 

@@ -138,7 +138,10 @@ bool MediaFile::WriteVideo(const VideoImage& image) {
         firstPicture_ = time;
         sourceBegin_ = SourceTime(image.reserved);
     }
+    const bool isAhead = plan_.pictures->end && time >= *plan_.pictures->end; // of a piece, and not in it
     record_->Update([&](WriterStatus& status) {
+        if (isAhead)
+            return;
         ++status.llPicturesReceived;
         status.llStampsRepaired = stamps_.Repairs();
         status.dVideoReceived =

@@ -295,6 +295,16 @@ int MWPlanTicks(const EncodeParam* param, const VideoFormat* video, const int64_
     });
 }
 
+int MWPicturesAhead(uint32_t codec, int speed) {
+    return Guarded(0, [&] {
+        const writer::PictureCodec* found = writer::FindPictureCodec(codec);
+        const int place = (speed != 0 ? speed : writer::kUsualSpeed) - 1;
+        return found == nullptr || place < 0 || place >= static_cast<int>(found->looksAhead.size())
+                   ? 0
+                   : found->looksAhead.at(static_cast<std::size_t>(place));
+    });
+}
+
 int MWJoinPieces(const wchar_t* fileName, const EncodeParam* param, const VideoFormat* video,
                  const AudioFormat* audio, const WriterJoin* join) {
     return Guarded(0, [&] {

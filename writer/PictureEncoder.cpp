@@ -6,7 +6,9 @@ extern "C" {
 
 #include <algorithm>
 #include <cmath>
+#include <new>
 #include <string>
+#include <utility>
 
 namespace writer {
 namespace {
@@ -71,10 +73,11 @@ void SetQuality(AVCodecContext& context, const QualityScale& scale, double quali
 } // namespace
 
 PictureEncoder::PictureEncoder(const PictureCodec& codec, const PictureSettings& settings, EncoderFlags flags,
-                               int ticksPerPicture)
+                               int ticksPerPicture, bool isCut)
     : ticksPerPicture_(ticksPerPicture),
       context_(NewEncoder(FindEncoder(codec), codec.code, flags)),
-      packet_(av::NewPacket()) {
+      packet_(av::NewPacket()),
+      holds_(isCut) {
     AVCodecContext& context = *context_;
     context.width = settings.width;
     context.height = settings.height;
@@ -113,20 +116,53 @@ PictureEncoder::PictureEncoder(const PictureCodec& codec, const PictureSettings&
 }
 
 void PictureEncoder::Encode(AVFrame& frame, int64_t tick, const PacketTaker& take) {
+    if (HasAll())
+        return;
     ticks_.push_back(tick);
     frame.pts = nextIndex_++;
     frame.pict_type = AV_PICTURE_TYPE_NONE;
     frame.quality = context_->global_quality;
-    Send(&frame, take);
+    if (!holds_)
+        return Send(&frame, take);
+    av::Frame next(av_frame_clone(&frame));
+    if (!next)
+        throw std::bad_alloc();
+    SendHeld(take);
+    held_ = std::move(next);
+}
+
+/// Nothing before the cut may build on what lies behind it: so the last picture is of the kind that builds on
+/// earlier ones only, before which no later one is coded.
+void PictureEncoder::CutHere(const PacketTaker& take) {
+    if (held_ && held_->pts > 0) // the first one builds on none
+        held_->pict_type = AV_PICTURE_TYPE_P;
+    SendHeld(take);
+    holds_ = false;
+    cut_ = nextIndex_;
 }
 
 void PictureEncoder::Finish(const PacketTaker& take) {
-    Send(nullptr, take);
+    SendHeld(take);
+    if (!HasAll())
+        Send(nullptr, take);
+}
+
+bool PictureEncoder::HasAll() const {
+    return cut_ && handedOut_ == *cut_;
+}
+
+void PictureEncoder::SendHeld(const PacketTaker& take) {
+    if (held_)
+        Send(held_.get(), take);
+    held_.reset();
 }
 
 void PictureEncoder::Send(AVFrame* frame, const PacketTaker& take) {
     writer::Encode(*context_, frame, *packet_, [&](AVPacket& packet) {
         const int64_t decodingIndex = packet.dts;
+        if (cut_ && packet.pts >= *cut_)
+            return;
+        ++handedOut_;
         packet.pts = TickOf(packet.pts);
         packet.dts = TickOf(decodingIndex);
         packet.duration = ticksPerPicture_;

@@ -37,12 +37,17 @@ struct PictureSettings {
 /// on time bases matter; packets carry the ticks that were given with the pictures.
 class PictureEncoder {
 public:
-    /// Throws WriterFailure (kWriterErrorCodec). `ticksPerPicture` is the usual distance of two pictures.
+    /// Throws WriterFailure (kWriterErrorCodec). `ticksPerPicture` is the usual distance of two pictures;
+    /// `isCut`: CutHere may be called.
     PictureEncoder(const PictureCodec& codec, const PictureSettings& settings, EncoderFlags flags,
-                   int ticksPerPicture);
+                   int ticksPerPicture, bool isCut);
 
     /// Encodes a picture that is shown from `tick` on; ticks rise. Throws WriterFailure (kWriterErrorEncode).
     void Encode(AVFrame& frame, int64_t tick, const PacketTaker& take);
+
+    /// Cuts behind the picture encoded last: what comes now is only looked at, and its packets are not handed
+    /// out. Once, and only where the codec looks ahead and `isCut` was told.
+    void CutHere(const PacketTaker& take);
 
     /// Hands out what is still inside. Nothing can be encoded afterwards.
     void Finish(const PacketTaker& take);
@@ -50,6 +55,8 @@ public:
     const AVCodecContext& Context() const { return *context_; }
 
 private:
+    bool HasAll() const;
+    void SendHeld(const PacketTaker& take);
     void Send(AVFrame* frame, const PacketTaker& take);
     int64_t TickOf(int64_t index) const;
 
@@ -59,6 +66,10 @@ private:
     std::deque<int64_t> ticks_; ///< Ticks of pictures that packets may still name, from firstIndex_ on.
     int64_t firstIndex_ = 0;
     int64_t nextIndex_ = 0;
+    int64_t handedOut_ = 0;      ///< Packets.
+    bool holds_;                 ///< The last picture is held back, since it may be the one before the cut.
+    av::Frame held_;             ///< That one.
+    std::optional<int64_t> cut_; ///< Pictures before the cut.
 };
 
 } // namespace writer

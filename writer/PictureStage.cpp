@@ -31,7 +31,8 @@ av::Frame CopyPicture(FramePool& pool, const VideoImage& image) {
 
 PictureStage::PictureStage(const PicturePlan& plan, EncoderFlags flags)
     : plan_(plan),
-      encoder_(*plan.codec, plan.settings, flags, plan.clock.ticksPerPicture),
+      encoder_(*plan.codec, plan.settings, flags, plan.clock.ticksPerPicture,
+               plan.end && plan.codec->looksAhead.at(static_cast<std::size_t>(plan.settings.speed)) > 0),
       pacer_(plan.clock, plan.keepStamps),
       scaler_(plan.picture, plan.sourceAspect, plan.stretch, plan.sourceFullRange),
       thread_(kMostPictures, 0,
@@ -59,21 +60,35 @@ void PictureStage::Run() {
     av::Frame open; // the picture whose showing is still open
     int64_t end = 0;
     while (std::optional<av::Frame> frame = thread_.Queue().Pop()) {
-        const int64_t time = (*frame)->pts;
+        int64_t time = (*frame)->pts;
+        const bool cuts = !isCut_ && plan_.end && time >= *plan_.end;
+        if (cuts)
+            time = *plan_.end;
+        if (cuts && pacer_.AnswersAtOnce())
+            Cut();
         end = time + plan_.pictureLength;
         const PicturePacer::Showing showing = pacer_.Add(time);
         // At once where possible: most of the picture is still in the processor's cache then.
         Show(pacer_.AnswersAtOnce() ? std::move(*frame) : std::exchange(open, std::move(*frame)), showing);
+        if (cuts && !pacer_.AnswersAtOnce()) // what was shown now is the picture before
+            Cut();
     }
-    Show(std::move(open), pacer_.Finish(plan_.end.value_or(end), plan_.end.has_value()));
+    if (!isCut_)
+        Show(std::move(open), pacer_.Finish(plan_.end.value_or(end), plan_.end.has_value()));
     encoder_.Finish(take_);
+}
+
+void PictureStage::Cut() {
+    encoder_.CutHere(take_);
+    isCut_ = true;
 }
 
 /// Does nothing without a picture.
 void PictureStage::Show(av::Frame picture, const PicturePacer::Showing& showing) {
     if (!picture)
         return;
-    shown_(showing.count);
+    if (!isCut_)
+        shown_(showing.count);
     if (showing.count == 0)
         return;
     picture = scaler_.Convert(std::move(picture));

@@ -41,6 +41,7 @@ public:
 
 private:
     void Run();
+    void Cut();
     void Show(av::Frame picture, const PicturePacer::Showing& showing);
 
     const PicturePlan& plan_;
@@ -51,6 +52,7 @@ private:
     FramePool pool_;       ///< Used by Push only.
     PacketTaker take_;
     Shown shown_;
+    bool isCut_ = false; ///< What comes now is behind the piece.
     StageThread<av::Frame> thread_;
 };
 

@@ -185,7 +185,8 @@ typedef struct WriterOptions {
         bPieceContinues; ///< Nonzero: a picture of the file is shown before this piece's; see llPieceTick.
     /// Where a piece with pictures lies in the file, in 100 ns units: its first picture.
     int64_t llPieceBegin;
-    int64_t llPieceEnd;  ///< The first picture of the piece that follows, -1 for the last one.
+    int64_t llPieceEnd;  ///< The first picture of the piece that follows, -1 for the last one. Pictures from
+                         ///< there on are only looked at, see MWPicturesAhead.
     int64_t llPieceTick; ///< As MWPlanTicks tells it for the piece's first picture.
 } WriterOptions;
 
@@ -332,6 +333,12 @@ int MWPlanTicks(const EncodeParam* param, const VideoFormat* video, const int64_
                 int64_t* ticks);
 
 #define kWriterNoTick INT64_MIN ///< No picture is shown before this one.
+
+/// How many pictures behind the end of a piece are to be written into it as well, where there are that many:
+/// its encoder looks at them, so that the last pictures of the piece get the bits that they get in an
+/// undivided file. None of them is in the piece. `codec` as in EncodeParam, `speed` as in WriterOptions.
+/// 0 when the encoder looks at none, or there is no such codec or speed.
+int MWPicturesAhead(uint32_t codec, int speed);
 
 /// What MWJoinPieces makes a file of.
 typedef struct WriterJoin {

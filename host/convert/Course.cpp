@@ -62,7 +62,7 @@ Course::Course(const Request& request, Movie& movie, Wishes& wishes, Observer& o
       engine_(MakeEngine(request_, movie.Info(), clips_.Pictures(), clips_.Sound(), watch_.OptionSet())),
       clock_(WorkClock::Now()) {
     if (request.piece && request.piece->pictures)
-        movie.EndPicturesAt(ToSeconds(request.piece->end));
+        movie.EndPicturesAt(ToSeconds(request.piece->until));
     else if (request.length)
         movie.EndPicturesAt(request.begin + length_);
     if (movie.KeepsHdr())

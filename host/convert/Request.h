@@ -31,6 +31,7 @@ struct PieceCut {
     int64_t origin = 0;          ///< Stamp of the output's first picture.
     int64_t begin = 0;           ///< Stamp of this piece's first picture.
     int64_t end = 0;             ///< Stamp of the next piece's first picture, or where the last one ends.
+    int64_t until = 0;           ///< Where the pictures end that its encoder looks at, `end` or later.
     bool last = false;           ///< No pictures follow.
     std::optional<int64_t> tick; ///< By the media writer's plan; nothing before the first picture shown.
     bool fromStart = false;      ///< The source can only be read from its start.

@@ -36,6 +36,7 @@ constexpr int kMostPieces = 10000;
 struct Piece {
     int64_t begin = 0;           ///< Stamp of its first picture.
     int64_t end = 0;             ///< Of the next piece's first; of the last one, where its last picture ends.
+    int64_t until = 0;           ///< Where the pictures end that its encoder looks at, `end` or later.
     int64_t pictures = 0;        ///< Of the source.
     std::optional<int64_t> tick; ///< See PieceCut.
     bool operator==(const Piece&) const = default;

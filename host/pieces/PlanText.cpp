@@ -18,7 +18,11 @@ constexpr int kVersion = 1;
 constexpr int64_t kLargestPlan = 16 << 20;
 
 Json AsJson(const Piece& piece) {
-    Json json{{"kind", "pictures"}, {"begin", piece.begin}, {"end", piece.end}, {"pictures", piece.pictures}};
+    Json json{{"kind", "pictures"},
+              {"begin", piece.begin},
+              {"end", piece.end},
+              {"readUntil", piece.until},
+              {"pictures", piece.pictures}};
     if (piece.tick)
         json["tickBefore"] = *piece.tick;
     return json;
@@ -110,10 +114,12 @@ Piece PieceFrom(const Json& json) {
     Piece piece;
     piece.begin = json.at("begin").get<int64_t>();
     piece.end = json.at("end").get<int64_t>();
+    piece.until = json.at("readUntil").get<int64_t>();
     piece.pictures = Natural(json, "pictures");
     if (json.contains("tickBefore"))
         piece.tick = json.at("tickBefore").get<int64_t>();
-    if (json.at("kind") != "pictures" || piece.end <= piece.begin || piece.pictures < 1)
+    if (json.at("kind") != "pictures" || piece.end <= piece.begin || piece.until < piece.end ||
+        piece.pictures < 1)
         RefusePlan("a piece holds no pictures");
     return piece;
 }

@@ -135,11 +135,15 @@ std::vector<std::size_t> FirstPictures(const Stamps& stamps, const Division& div
     }
 }
 
-std::vector<std::optional<int64_t>> TicksBefore(const Request& request, Movie& movie, const Stamps& stamps,
-                                                const SourceInfo& source) {
-    const Engine engine = MakeEngine(request, source, movie.Pictures(), nullptr);
+EncodeParam ParamFor(const Request& request, Movie& movie) {
+    const Engine engine = MakeEngine(request, movie.Info(), movie.Pictures(), nullptr);
     EncodeParam param{};
     MCGetEncodeParam(engine.get(), &param);
+    return param;
+}
+
+std::vector<std::optional<int64_t>> TicksBefore(const EncodeParam& param, Movie& movie,
+                                                const Stamps& stamps) {
     const VideoFormat format = movie.Pictures()->GetVideoInfo()->format;
     std::vector<int64_t> times = stamps.times;
     for (int64_t& time : times)
@@ -151,6 +155,13 @@ std::vector<std::optional<int64_t>> TicksBefore(const Request& request, Movie& m
     for (const int64_t tick : ticks)
         before.push_back(tick == kWriterNoTick ? std::nullopt : std::optional(tick));
     return before;
+}
+
+/// Pictures behind its end that the encoder of a piece looks at.
+std::size_t PicturesAhead(const EncodeParam& param, const Request& request, const SourceInfo& source) {
+    const PicturePlan plan = PlanPictures(request, ChooseFormat(request), *source.pictures);
+    const int speed = plan.speed ? static_cast<int>(*plan.speed) : 0;
+    return static_cast<std::size_t>(MWPicturesAhead(param.fccVideo, speed));
 }
 
 } // namespace
@@ -206,13 +217,19 @@ std::optional<Plan> MakePlan(const Request& request, const Division& division, b
     if (firsts.size() > std::size_t{kMostPieces})
         throw Failure(Category::kRequest, fmt::format("that makes {} pieces; at most {} can be made",
                                                       firsts.size(), kMostPieces));
-    const auto ticks = TicksBefore(pictures, movie, *stamps, movie.Info());
+    const EncodeParam param = ParamFor(pictures, movie);
+    const auto ticks = TicksBefore(param, movie, *stamps);
+    const std::size_t ahead = PicturesAhead(param, pictures, movie.Info());
     for (std::size_t i = 0; i < firsts.size(); ++i) {
         const std::size_t next = i + 1 < firsts.size() ? firsts[i + 1] : stamps->times.size();
         Piece piece;
         piece.begin = stamps->times[firsts[i]];
-        piece.end =
-            next < stamps->times.size() ? stamps->times[next] : std::max(stamps->end, piece.begin + 1);
+        const auto timeOf = [&](std::size_t picture) {
+            return picture < stamps->times.size() ? stamps->times[picture]
+                                                  : std::max(stamps->end, stamps->times.back() + 1);
+        };
+        piece.end = timeOf(next);
+        piece.until = timeOf(next + ahead);
         piece.pictures = static_cast<int64_t>(next - firsts[i]);
         piece.tick = ticks[firsts[i]];
         plan.pictures.push_back(piece);
@@ -250,11 +267,12 @@ Request RequestFor(const Plan& plan, int number, const std::string& output) {
         const Piece& piece = plan.pictures[place];
         cut.begin = piece.begin;
         cut.end = piece.end;
+        cut.until = piece.until;
         cut.last = place + 1 == plan.pictures.size();
         cut.tick = piece.tick;
         if (number > 0)
             request.begin = ToSeconds(piece.begin);
-        request.length = ToSeconds(piece.end - piece.begin);
+        request.length = ToSeconds(piece.until - piece.begin);
     }
     request.piece = cut;
     return request;
