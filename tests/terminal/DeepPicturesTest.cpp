@@ -21,7 +21,6 @@ constexpr SourceChoice kAsTheyAre{.deep = true, .keepHdr = true};
 constexpr int kPq = 16;
 constexpr int kHlg = 18;
 constexpr int kBt709 = 1;
-constexpr int kBt2020 = 9;
 
 /// The value of a component, whatever the depth.
 int At(const VideoImage& image, int plane, int x, int y) {
