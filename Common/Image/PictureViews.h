@@ -87,6 +87,11 @@ struct Picture {
         __builtin_prefetch(p + i, 0, 2);
 }
 
+[[gnu::always_inline]] inline void PrefetchRows(RowPair rows, ptrdiff_t distance, ptrdiff_t bytes) {
+    PrefetchRow(rows.first + distance, bytes);
+    PrefetchRow(rows.second + distance, bytes);
+}
+
 /// Calls visit(row0, row1, chromaRow) for every pair of rows. An odd last row comes as a pair with itself:
 /// averaging a row with itself gives exactly the average of the pixels that exist, and writing it twice
 /// writes the same bytes.

@@ -153,8 +153,7 @@ public:
     template <class Columns>
     void operator()(Columns columns, const PlanesPair& target, RowPair rgb, ptrdiff_t x,
                     ptrdiff_t toNextRows) const {
-        PrefetchRow(rgb.first + Read::kBytes * x + toNextRows, Read::kBytes * kRgbStep);
-        PrefetchRow(rgb.second + Read::kBytes * x + toNextRows, Read::kBytes * kRgbStep);
+        PrefetchRows(rgb, Read::kBytes * x + toNextRows, Read::kBytes * kRgbStep);
         const PixelRun upper = read_(columns, rgb.first, x);
         const Components a = convert_(upper.first);
         const Components b = convert_(upper.second);

@@ -69,6 +69,7 @@ __m256i LoadHalf(Columns, const uint8_t* source, ptrdiff_t bytes) {
 
 /// Where whole registers of packed rows and single planes go.
 struct Cached {
+    static constexpr bool kPastCaches = false;
     static void Store(uint8_t* target, __m512i value) { _mm512_storeu_si512(target, value); }
     static void Finish() {}
 };
@@ -76,6 +77,7 @@ struct Cached {
 /// Past the caches, for targets that none of them holds: whole cache lines where the target begins with one,
 /// else their quarters, because allocated memory is aligned to 16 bytes.
 struct Streamed {
+    static constexpr bool kPastCaches = true;
     static void Store(uint8_t* target, __m512i value) {
         if (reinterpret_cast<uintptr_t>(target) % sizeof value == 0) {
             _mm512_stream_si512(reinterpret_cast<__m512i*>(target), value);

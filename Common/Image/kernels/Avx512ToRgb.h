@@ -195,10 +195,10 @@ void RgbFrom420(Rows rgb, Planes420 source, Size size) {
         ForSteps<kStep>(size.width, [&](ptrdiff_t x, auto columns) {
             const ChromaTerms<Form> terms(chroma(columns, from.u, from.v, x));
             const auto luma = [&](const uint8_t* row) { return Load(columns, row + x, columns.count); };
-            if constexpr (Target::kReads) {
-                PrefetchRow(to.first + 2 * rgb.step + 4 * x, 4 * kStep);
-                PrefetchRow(to.second + 2 * rgb.step + 4 * x, 4 * kStep);
-            }
+            if constexpr (Target::kReads)
+                PrefetchRows(to, 4 * x + 2 * rgb.step, 4 * kStep);
+            if constexpr (Memory::kPastCaches)
+                PrefetchRows(from.y, x + 2 * source.y.step, kStep);
             store(columns, to.first, x, ToRgb<Form>(luma(from.y.first), terms));
             store(columns, to.second, x, ToRgb<Form>(luma(from.y.second), terms));
         });

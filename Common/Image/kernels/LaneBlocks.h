@@ -19,6 +19,7 @@
 #include <array>
 #include <cstddef>
 #include <cstdint>
+#include <type_traits>
 
 namespace image {
 namespace {
@@ -29,6 +30,10 @@ using LaneBytes = std::array<int8_t, 16>;
 /// Pixels of a block.
 template <class V>
 constexpr ptrdiff_t kLanePixels = sizeof(typename V::Vec);
+
+/// Whether the kernels are those for large targets.
+template <class V>
+constexpr bool kPastCaches = !std::is_same_v<V, typename V::Cached>;
 
 /// Calls block(x) so that all columns of an even width are covered, and last(done) for an odd column
 /// behind them. The width is not less than a block. One place calls the block, so that the compiler keeps

@@ -87,6 +87,8 @@ struct LanePacked {
                         ForBlocks(size.width, kPixels, [&](ptrdiff_t x) {
                             const PlanesPair at = Advance(from, x);
                             const RowPair groups = Advance(to, 2 * x);
+                            if constexpr (kPastCaches<V>)
+                                PrefetchRows(at.y, 2 * source.y.step, kPixels);
                             const Vec uv = V::LoadAlternating(at.u, at.v);
                             StorePacked<kOrder>(groups.first, V::Load(at.y.first), uv);
                             StorePacked<kOrder>(groups.second, V::Load(at.y.second), uv);

@@ -155,10 +155,10 @@ struct LaneToRgb {
                             [&](ptrdiff_t x) {
                                 const PlanesPair at = Advance(from, x);
                                 const RowPair pixels = Advance(to, Target::kBytes * x);
-                                if constexpr (Target::kReads) {
-                                    PrefetchRow(pixels.first + 2 * rgb.step, Target::kBytes * kPixels);
-                                    PrefetchRow(pixels.second + 2 * rgb.step, Target::kBytes * kPixels);
-                                }
+                                if constexpr (Target::kReads)
+                                    PrefetchRows(pixels, 2 * rgb.step, Target::kBytes * kPixels);
+                                if constexpr (kPastCaches<V>)
+                                    PrefetchRows(at.y, 2 * source.y.step, kPixels);
                                 const ChromaTerms terms = MakeTerms<Form>(LoadChroma<Target>(at.u, at.v));
                                 Target::Store(pixels.first,
                                               MakeComponents<Form>(LoadLuma<Target>(at.y.first), terms));

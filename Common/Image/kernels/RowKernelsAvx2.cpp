@@ -160,10 +160,7 @@ struct Avx2Large : Avx2 {
     }
     template <size_t kParts>
     static void StoreLanes(uint8_t* p, const Vec (&parts)[kParts]) {
-        for (size_t i = 0; i < kParts; ++i)
-            StoreLane(p + 16 * i, LowLane(parts[i]));
-        for (size_t i = 0; i < kParts; ++i)
-            StoreLane(p + 16 * (kParts + i), HighLane(parts[i]));
+        ForVectors(parts, [p](ptrdiff_t offset, Vec a) { Store(p + offset, a); });
     }
 
     static void FinishPicture() { _mm_sfence(); }

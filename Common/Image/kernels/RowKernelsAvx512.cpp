@@ -105,6 +105,8 @@ void PackedFrom420(Rows packed, Planes420 source, Size size) {
     const Pick second(kSecond);
     ForRowPairs(source, packed, size.height, [&](PlanesPair from, RowPair to, ptrdiff_t, ptrdiff_t) {
         ForSteps<kStep>(size.width, [&](ptrdiff_t x, auto columns) {
+            if constexpr (Memory::kPastCaches)
+                PrefetchRows(from.y, x + 2 * source.y.step, kStep);
             const __m256i u = LoadHalf(columns, from.u + x / 2, columns.count / 2);
             const __m256i v = LoadHalf(columns, from.v + x / 2, columns.count / 2);
             const __m512i chroma = _mm512_inserti64x4(_mm512_castsi256_si512(u), v, 1);
