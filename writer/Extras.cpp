@@ -1,5 +1,7 @@
 #include "writer/Extras.h"
 
+#include "writer/BigEndian.h"
+
 #include <algorithm>
 #include <array>
 #include <cstring>
@@ -14,18 +16,15 @@ struct Size {
     int height;
 };
 
-int Number(const uint8_t* bytes, int count) {
-    int value = 0;
-    for (int i = 0; i < count; ++i)
-        value = value << 8 | bytes[i];
-    return value;
+int SideFrom(const uint8_t* bytes, size_t size) {
+    return static_cast<int>(BigEndian(bytes, size));
 }
 
 std::optional<Size> PngSize(const std::vector<uint8_t>& data) {
     static constexpr std::array<uint8_t, 8> kSignature{0x89, 'P', 'N', 'G', '\r', '\n', 0x1A, '\n'};
     if (data.size() < 24 || !std::equal(kSignature.begin(), kSignature.end(), data.begin()))
         return std::nullopt;
-    return Size{Number(&data[16], 4), Number(&data[20], 4)};
+    return Size{SideFrom(&data[16], 4), SideFrom(&data[20], 4)};
 }
 
 /// Its first frame header tells.
@@ -37,8 +36,8 @@ std::optional<Size> JpegSize(const std::vector<uint8_t>& data) {
         const bool isFrame =
             marker >= 0xC0 && marker <= 0xCF && marker != 0xC4 && marker != 0xC8 && marker != 0xCC;
         if (isFrame)
-            return Size{Number(&data[at + 7], 2), Number(&data[at + 5], 2)};
-        at += marker == 0xFF ? 1 : 2 + static_cast<size_t>(Number(&data[at + 2], 2));
+            return Size{SideFrom(&data[at + 7], 2), SideFrom(&data[at + 5], 2)};
+        at += marker == 0xFF ? 1 : 2 + BigEndian(&data[at + 2], 2);
     }
     return std::nullopt;
 }

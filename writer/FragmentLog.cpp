@@ -1,5 +1,6 @@
 #include "writer/FragmentLog.h"
 
+#include "writer/BigEndian.h"
 #include "writer/WriterFailure.h"
 #include "writer/WriterStatus.h"
 
@@ -31,12 +32,7 @@ public:
         bytes_ = bytes_.subspan(count);
         return taken;
     }
-    uint64_t Number(size_t size) {
-        uint64_t value = 0;
-        for (const uint8_t byte : Take(size))
-            value = value << 8 | byte;
-        return value;
-    }
+    uint64_t Number(size_t size) { return BigEndian(Take(size).data(), size); }
     uint32_t U32() { return static_cast<uint32_t>(Number(4)); }
 
     /// The content of the next box, whose type is stored.

@@ -1,5 +1,6 @@
 #include "writer/Fragments.h"
 
+#include "writer/BigEndian.h"
 #include "writer/TextRows.h"
 #include "writer/WriterFailure.h"
 #include "writer/WriterStatus.h"
@@ -10,7 +11,6 @@
 #include <cstdio>
 #include <cstring>
 #include <new>
-#include <numeric>
 #include <optional>
 
 namespace writer {
@@ -70,9 +70,8 @@ struct Box {
     bool Is(const char* name) const { return std::memcmp(type.data(), name, type.size()) == 0; }
 };
 
-int64_t Number(const uint8_t* bytes, int size) {
-    return std::accumulate(bytes, bytes + size, int64_t{0},
-                           [](int64_t value, uint8_t byte) { return value << 8 | byte; });
+int64_t SizeFrom(const uint8_t* bytes, size_t size) {
+    return static_cast<int64_t>(BigEndian(bytes, size));
 }
 
 Box ReadBox(ByteFile& file, int64_t position) {
@@ -80,13 +79,13 @@ Box ReadBox(ByteFile& file, int64_t position) {
     int64_t headerSize = kBoxHeaderSize;
     if (!ReadAll(file, position, header.data(), headerSize))
         return {};
-    Box box{{}, Number(header.data(), 4)};
+    Box box{{}, SizeFrom(header.data(), 4)};
     std::memcpy(box.type.data(), &header[4], box.type.size());
     if (box.size == 1) {
         headerSize = 16;
         if (!ReadAll(file, position + 8, &header[8], 8))
             return {};
-        box.size = Number(&header[8], 8);
+        box.size = SizeFrom(&header[8], 8);
     }
     return box.size < headerSize ? Box{} : box;
 }

@@ -14,7 +14,6 @@
 namespace writer {
 namespace {
 
-constexpr double kMicroseconds = 1e6;
 constexpr int kNoStream = INT_MAX; // none has that number
 
 } // namespace

@@ -24,7 +24,6 @@ constexpr uint8_t kPacket = 'p';
 constexpr uint8_t kEnd = 'e';
 constexpr int64_t kMostStreams = 1000;
 constexpr int64_t kMostDescription = 64 << 20;
-constexpr int64_t kMicroseconds = 1'000'000;
 
 /// A file that is only read.
 class ReadFile final : public ByteFile {

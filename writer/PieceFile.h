@@ -23,6 +23,8 @@
 
 namespace writer {
 
+constexpr int64_t kMicroseconds = 1'000'000; ///< Of the times in a piece's totals, in a second.
+
 /// Writes one. The totals at its end are those of `record`, which outlives it.
 class PieceWriter final : public PacketWriter {
 public:
