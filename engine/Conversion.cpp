@@ -104,10 +104,7 @@ void ConvThread::Conversion::Send(const VideoImage& picture) {
     const bool taken = MWWriteVideoFrame(hFile, &picture) != 0;
     bFileEmpty = false;
     nPicturesTaken += taken ? 1 : 0;
-    converter.results.Update([taken](MCResult& result) {
-        ++result.llPicturesSent;
-        result.llPicturesRefused += taken ? 0 : 1;
-    });
+    converter.results.CountPicture(taken);
     if (!taken)
         NoteFailure(MC_RESULT_REFUSED, FaultOf(picture));
 }
@@ -120,10 +117,7 @@ void ConvThread::Conversion::Send(const AudioFrame& block) {
     const int32_t frame = WrapMul(block.nChannels, block.nBitsPerSample) / 8;
     const int32_t samples = frame > 0 ? block.nLength / frame : 0;
     nSamplesTaken += taken ? samples : 0;
-    converter.results.Update([=](MCResult& result) {
-        result.llSamplesSent += samples;
-        result.llSamplesRefused += taken ? 0 : samples;
-    });
+    converter.results.CountSamples(samples, taken);
     if (!taken)
         NoteFailure(MC_RESULT_REFUSED,
                     "A block of sound was not taken by the media writer: its format makes no sense, "

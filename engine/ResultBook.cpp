@@ -25,6 +25,8 @@ void ResultBook::Begin() {
     result.nSize = sizeof result;
     result.nCategory = MC_RESULT_RUNNING;
     result.nOutcome = -1;
+    for (Count* const count : {&picturesSent, &picturesRefused, &samplesSent, &samplesRefused})
+        *count = 0;
 }
 
 void ResultBook::Fail(int category, const char* what, const char* path, int systemError) {
@@ -50,9 +52,9 @@ void ResultBook::End(unsigned outcome, bool pictures) {
         FailLocked(MC_RESULT_CANCELLED, "The conversion was cancelled by its callback.", "", 0);
     else if (outcome == kOutcomeFailed)
         FailLocked(MC_RESULT_INTERNAL, "The conversion could not be started.", "", 0);
-    else if (pictures && result.llPicturesSent == 0)
+    else if (pictures && picturesSent == 0)
         FailLocked(MC_RESULT_SOURCE, "The source was to have pictures, but gave none.", "", 0);
-    else if (result.llPicturesSent == 0 && result.llSamplesSent == 0)
+    else if (picturesSent == 0 && samplesSent == 0)
         FailLocked(MC_RESULT_SOURCE, "The source gave nothing.", "", 0);
     else
         FailLocked(MC_RESULT_DONE, "", "", 0);
@@ -65,7 +67,12 @@ bool ResultBook::Copy(MCResult* to) const {
         return false;
     const uint32_t size = std::min<uint32_t>(to->nSize, sizeof result);
     const CSingleLock guard(&lock);
-    std::memcpy(to, &result, size);
-    to->nSize = size;
+    MCResult now = result;
+    now.nSize = size;
+    now.llPicturesSent = picturesSent;
+    now.llPicturesRefused = picturesRefused;
+    now.llSamplesSent = samplesSent;
+    now.llSamplesRefused = samplesRefused;
+    std::memcpy(to, &now, size);
     return true;
 }

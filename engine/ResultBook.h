@@ -5,6 +5,9 @@
 #include "engine/Result.h"
 #include "thread/SingleLock.h"
 
+#include <atomic>
+#include <cstdint>
+
 #include <pthread.h>
 
 class ResultBook {
@@ -25,7 +28,18 @@ public:
     /// have sent pictures where `pictures` are wanted.
     void End(unsigned outcome, bool pictures);
 
-    /// Changes figures.
+    /// Counts a picture, samples of sound, sent to the media writer. The worker's alone, for every record:
+    /// they need no lock. Who reads meanwhile sees each figure whole, but not all of them of one moment.
+    void CountPicture(bool taken) {
+        Raise(picturesSent, 1);
+        Raise(picturesRefused, taken ? 0 : 1);
+    }
+    void CountSamples(int32_t samples, bool taken) {
+        Raise(samplesSent, samples);
+        Raise(samplesRefused, taken ? 0 : samples);
+    }
+
+    /// Changes other figures.
     template <class Change>
     void Update(Change change) {
         const CSingleLock guard(&lock);
@@ -36,10 +50,20 @@ public:
     bool Copy(MCResult* to) const;
 
 private:
+    using Count = std::atomic<int64_t>;
+
+    static void Raise(Count& count, int64_t by) {
+        count.store(count.load(std::memory_order_relaxed) + by, std::memory_order_relaxed);
+    }
+
     void FailLocked(int category, const char* what, const char* path, int systemError);
 
     mutable pthread_mutex_t lock = PTHREAD_MUTEX_INITIALIZER;
     MCResult result{sizeof(MCResult), 0, MC_RESULT_NONE, -1, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, {}, {}};
+    Count picturesSent{0};
+    Count picturesRefused{0};
+    Count samplesSent{0};
+    Count samplesRefused{0};
 };
 
 #endif
