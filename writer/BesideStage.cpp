@@ -81,10 +81,10 @@ private:
 
 /// Makes what the plan says, for the container. Throws WriterFailure.
 std::unique_ptr<BesideTrack> MakeBesideTrack(const TrackPlan& plan, const Container& container,
-                                             EncoderFlags flags) {
+                                             EncoderFlags flags, bool isFirst) {
     if (plan.sound)
         return std::make_unique<EncodedSound>(plan, container, flags);
-    return MakePacketTrack(*plan.track, container);
+    return MakePacketTrack(*plan.track, container, isFirst);
 }
 
 } // namespace
@@ -99,9 +99,9 @@ BesideStage::~BesideStage() {
     Join();
 }
 
-void BesideStage::Add(const TrackPlan& plan, const Container& container, EncoderFlags flags,
+void BesideStage::Add(const TrackPlan& plan, const Container& container, EncoderFlags flags, bool isFirst,
                       PacketWriter& file) {
-    std::unique_ptr<BesideTrack> writer = MakeBesideTrack(plan, container, flags);
+    std::unique_ptr<BesideTrack> writer = MakeBesideTrack(plan, container, flags, isFirst);
     const int stream = file.AddStream(writer->Stream());
     tracks_.push_back({&plan, stream, std::move(writer)});
 }

@@ -42,6 +42,9 @@ public:
     /// No item begins before `time` any more.
     virtual void Reach(int64_t /*time*/) {}
 
+    /// Of sound that is handed on as it comes, from what is heard first to the end.
+    virtual double Seconds() const { return 0; }
+
     /// Nothing more will come.
     virtual void Finish() = 0;
     virtual void Cancel() = 0;
@@ -56,10 +59,14 @@ public:
     BesideStage& operator=(const BesideStage&) = delete;
     ~BesideStage();
 
-    /// `plan` outlives it. Throws WriterFailure.
-    void Add(const TrackPlan& plan, const Container& container, EncoderFlags flags, PacketWriter& file);
+    /// `plan` outlives it. `isFirst`: the file is the first one of the track. Throws WriterFailure.
+    void Add(const TrackPlan& plan, const Container& container, EncoderFlags flags, bool isFirst,
+             PacketWriter& file);
 
     bool Empty() const { return tracks_.empty(); }
+
+    /// The first track's, once it is joined.
+    double Seconds() const { return tracks_.empty() ? 0 : tracks_.front().writer->Seconds(); }
 
     /// Starts the threads. Time 0 of the file is `begin` in the source, in 100 ns units as all times.
     void Start(int64_t begin, const std::function<void(AVPacket& packet, int stream)>& write,

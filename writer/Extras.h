@@ -53,6 +53,11 @@ struct Track {
     void* context = nullptr;
 };
 
+/// Whether its packets are sound.
+inline bool IsSound(const Track& track) {
+    return track.parameters && track.parameters->codec_type == AVMEDIA_TYPE_AUDIO;
+}
+
 /// Of one set. Copies share the large data.
 struct Extras {
     Tags tags;

@@ -37,14 +37,14 @@ void FileFinisher::TellLengths() {
     int stream = 0;
     if (plan_.HoldsPictures())
         pictures = part_.Streams().Stream(stream++).seconds;
-    if (plan_.sound)
+    if (plan_.sound || plan_.soundBeside)
         sound = part_.Streams().Stream(stream).seconds;
     record_.Update([&](WriterStatus& status) {
         // Pieces are held against their plan, by number.
         status.dVideoWritten = plan_.piece == kWriterPieceNone ? pictures : status.dVideoReceived;
         // Some codecs count the padding of the last frame.
         const double encoded =
-            plan_.sound ? static_cast<double>(status.llSamplesWritten) / status.nSampleRate : 0.0;
+            plan_.sound ? static_cast<double>(status.llSamplesWritten) / status.nSampleRate : sound;
         status.dAudioWritten = std::min(encoded, sound);
     });
 }

@@ -235,10 +235,14 @@ int64_t IndexSize(const FilePlan& plan, const VideoFormat* video, const AudioFor
         length = std::max(length, double{audio->dDuration});
         perSecond += kPerPacket * plan.sound->settings.sampleRate / kSamplesPerPacket;
     }
-    for (const TrackPlan& track : plan.tracks)
-        perSecond += track.sound
-                         ? kPerPacket * track.sound->settings.sampleRate / kSamplesPerPacket + kPerSecond / 2
-                         : kPerCue;
+    if (plan.soundBeside)
+        length = std::max(length, double{audio->dDuration});
+    for (const TrackPlan& track : plan.tracks) {
+        const int rate = track.sound             ? track.sound->settings.sampleRate
+                         : IsSound(*track.track) ? track.track->parameters->sample_rate
+                                                 : 0;
+        perSecond += rate > 0 ? kPerPacket * rate / kSamplesPerPacket + kPerSecond / 2 : kPerCue;
+    }
     if (fileLength > 0 && (length <= 0 || fileLength < length))
         length = fileLength;
     const double size = (length > 0 ? length : kUnknown) * perSecond;
@@ -255,12 +259,17 @@ FilePlan MakeFilePlan(const EncodeParam& param, const VideoFormat* video, const 
         throw WriterFailure(kWriterErrorFormat, "The file format " + FormatText(param) + " is not known.");
     if (video != nullptr && param.bNoVideo == 0 && plan.container->video.front() != 0)
         plan.pictures = MakePicturePlan(param, *video, *plan.container, options);
-    if (audio != nullptr && param.bNoAudio == 0 && plan.container->audio.front() != 0)
+    const bool hasSound = audio != nullptr && param.bNoAudio == 0 && plan.container->audio.front() != 0;
+    plan.soundBeside = hasSound && options.bSoundBeside != 0;
+    if (hasSound && !plan.soundBeside)
         plan.sound = MakeSoundPlan(param, *audio, *plan.container);
-    if (!plan.pictures && !plan.sound)
+    if (!plan.pictures && !hasSound)
         throw WriterFailure(kWriterErrorArgument,
                             "There is nothing to write into a file of the format " + FormatText(param) + ".");
     plan.tracks = MakeTrackPlans(param, plan, extras);
+    if (plan.soundBeside && (plan.tracks.empty() || !IsSound(*plan.tracks.front().track)))
+        throw WriterFailure(kWriterErrorCodec,
+                            "The format " + FormatText(param) + " cannot carry the sound as it is.");
     plan.bitExact = options.bBitExact != 0;
     plan.piece = options.nPiece;
     plan.indexSize = IndexSize(plan, video, audio, options.dFileLength);

@@ -54,6 +54,7 @@ struct FilePlan {
     const Container* container;
     std::optional<PicturePlan> pictures;
     std::optional<SoundPlan> sound;
+    bool soundBeside;              ///< The engine's sound does not go in, a track does.
     std::vector<TrackPlan> tracks; ///< Those that the container carries.
     bool bitExact;
     int piece; ///< kWriterPiece...

@@ -36,6 +36,7 @@ constexpr uint32_t kMp2 = FourCC("MP2 ");
 constexpr uint32_t kOpus = FourCC("OPUS");
 constexpr uint32_t kVorbis = FourCC("VORB");
 constexpr uint32_t kPcm = FourCC("PCM ");
+constexpr uint32_t kEac3 = FourCC("EAC3"); // copied only
 
 // clang-format off
 constexpr AVPixelFormat kPlanar = AV_PIX_FMT_YUV420P;
@@ -98,41 +99,50 @@ constexpr uint32_t kTracks = kWriterFormatTracks;
 constexpr const char* kMp4Subtitles = "mov_text";
 constexpr const char* kMatroskaSubtitles = "subrip,ass,ssa,text,webvtt,hdmv_pgs_subtitle,hdmv_text_subtitle,"
                                            "dvd_subtitle,dvb_subtitle";
+constexpr const char* kMp4Sound = "aac,mp3,mp2,ac3,eac3,opus,vorbis,alac,dts";
+constexpr const char* kMovSound = "aac,mp3,ac3,eac3,alac,pcm_s16le,pcm_s16be,pcm_s24le,pcm_s24be,pcm_s32le,pcm_s32be,"
+                                  "pcm_f32le,pcm_f32be,pcm_u8,pcm_s8,pcm_alaw,pcm_mulaw";
+constexpr const char* kMatroskaSound = "aac,mp3,mp2,ac3,eac3,dts,truehd,mlp,flac,alac,opus,vorbis,tta,wavpack,"
+                                       "pcm_s16le,pcm_s24le,pcm_s32le,pcm_s16be,pcm_s24be,pcm_s32be,pcm_f32le,"
+                                       "pcm_f64le,pcm_u8";
+constexpr const char* kAviSound = "mp3,mp2,ac3,dts,aac,pcm_s16le,pcm_s24le,pcm_s32le,pcm_u8,pcm_alaw,pcm_mulaw";
+constexpr const char* kTsSound = "aac,aac_latm,mp3,mp2,ac3,eac3,dts,truehd,opus";
+constexpr const char* kWavSound = "pcm_s16le,pcm_s24le,pcm_s32le,pcm_f32le,pcm_f64le,pcm_u8,pcm_alaw,pcm_mulaw,mp3,ac3";
 constexpr const char* kClusters = "cluster_time_limit=1000"; // what is lost at most when a file is cut off
 constexpr std::array kContainers{
     Container{FourCC("MP4 "), "MP4 (MPEG-4 Part 14)", "mp4,m4v", "mp4", kFragmented, nullptr,
-              kTags | kChapters | kCover | kTracks, kMp4Subtitles, false,
+              kTags | kChapters | kCover | kTracks, kMp4Subtitles, kMp4Sound, false,
               {kXvid, kH264, kHevc, kMjpg, kVp9, kMpeg2, kAv1}, {kAac, kMp3, kAc3, kOpus, kVorbis}},
     Container{FourCC("MOV "), "QuickTime", "mov,qt", "mov", kFragmented, nullptr,
-              kTags | kChapters | kTracks, kMp4Subtitles, false,
+              kTags | kChapters | kTracks, kMp4Subtitles, kMovSound, false,
               {kXvid, kH264, kHevc, kMjpg, kMpeg2}, {kAac, kMp3, kAc3, kAlac, kPcm}},
     Container{FourCC("MKV "), "Matroska", "mkv", "matroska", kStreamed, kClusters,
-              kTags | kChapters | kCover | kFiles | kTracks, kMatroskaSubtitles, false,
+              kTags | kChapters | kCover | kFiles | kTracks, kMatroskaSubtitles, kMatroskaSound, false,
               {kXvid, kH264, kHevc, kMjpg, kVp8, kVp9, kMpeg2, kFlv1, kAv1, kFfv1},
               {kAac, kMp3, kAc3, kFlac, kOpus, kVorbis, kAlac, kMp2, kPcm}},
     Container{FourCC("AVI "), "AVI (Audio Video Interleaved)", "avi,divx", "avi", kSteadyRate, nullptr,
-              kTags | kTracks, nullptr, false,
+              kTags | kTracks, nullptr, kAviSound, false,
               {kXvid, kH264, kMjpg, kVp8, kMpeg2, kFlv1}, {kMp3, kAac, kAc3, kPcm}},
     Container{FourCC("WEBM"), "WebM", "webm", "webm", kStreamed, kClusters,
-              kTags | kChapters | kTracks, "webvtt", false, {kVp8, kVp9, kAv1}, {kVorbis, kOpus}},
+              kTags | kChapters | kTracks, "webvtt", "vorbis,opus", false, {kVp8, kVp9, kAv1}, {kVorbis, kOpus}},
     Container{FourCC("FLV "), "Flash Video", "flv", "flv", kStreamed, nullptr,
-              kTags, nullptr, false, {kH264, kFlv1}, {kAac, kMp3}},
+              kTags, nullptr, "aac,mp3", false, {kH264, kFlv1}, {kAac, kMp3}},
     Container{FourCC("TS  "), "MPEG transport stream", "ts,m2ts,mts", "mpegts", kStreamed, nullptr,
-              kTags | kTracks, "dvb_subtitle", false,
+              kTags | kTracks, "dvb_subtitle", kTsSound, false,
               {kH264, kHevc, kXvid, kMpeg2}, {kAac, kMp3, kAc3, kOpus, kMp2}},
     Container{FourCC("MPG "), "MPEG program stream", "mpg,mpeg,vob", "vob", kStreamed, nullptr,
-              0, nullptr, false, {kMpeg2}, {kMp2, kAc3}},
-    Container{kGif, "GIF (animated)", "gif", "gif", kStreamed, nullptr, 0, nullptr, false, {kGif}, {}},
+              0, nullptr, "mp2,mp3,ac3,dts", false, {kMpeg2}, {kMp2, kAc3}},
+    Container{kGif, "GIF (animated)", "gif", "gif", kStreamed, nullptr, 0, nullptr, nullptr, false, {kGif}, {}},
     Container{FourCC("M4A "), "MPEG-4 audio", "m4a,m4b", "ipod", kFragmented, nullptr,
-              kTags | kChapters | kCover | kTracks, kMp4Subtitles, false, {}, {kAac, kAc3, kAlac}},
+              kTags | kChapters | kCover | kTracks, kMp4Subtitles, "aac,alac,ac3,eac3", false, {}, {kAac, kAc3, kAlac}},
     Container{FourCC("MP3 "), "MP3", "mp3", "mp3", kStreamed, nullptr,
-              kTags | kCover, nullptr, false, {}, {kMp3}},
+              kTags | kCover, nullptr, "mp3", false, {}, {kMp3}},
     Container{FourCC("WAV "), "WAV (RIFF wave)", "wav", "wav", kSteadyRate, "rf64=auto",
-              kTags, nullptr, false, {}, {kPcm, kMp3, kAc3}},
+              kTags, nullptr, kWavSound, false, {}, {kPcm, kMp3, kAc3}},
     Container{FourCC("FLAC"), "FLAC", "flac", "flac", kStreamed, nullptr,
-              kTags | kCover, nullptr, false, {}, {kFlac}},
+              kTags | kCover, nullptr, "flac", false, {}, {kFlac}},
     Container{FourCC("OGG "), "Ogg", "ogg,oga,opus", "ogg", kStreamed, nullptr,
-              kTags, nullptr, true, {}, {kVorbis, kOpus, kFlac}},
+              kTags, nullptr, "vorbis,opus,flac,speex", true, {}, {kVorbis, kOpus, kFlac}},
 };
 
 constexpr std::array kFlashRates{44100, 22050, 11025, 0};
@@ -145,6 +155,9 @@ constexpr std::array kCarriages{
     Carriage{FourCC("MP4 "), kAc3, 0, true},
     Carriage{FourCC("MOV "), kAc3, 0, true},
     Carriage{FourCC("M4A "), kAc3, 0, true},
+    Carriage{FourCC("MP4 "), kEac3, 0, true},
+    Carriage{FourCC("MOV "), kEac3, 0, true},
+    Carriage{FourCC("M4A "), kEac3, 0, true},
     Carriage{FourCC("FLV "), kMp3, 0, false, kFlashRates.data()},
 };
 
@@ -260,10 +273,10 @@ const AVCodec* FindEncoder(const SoundCodec& codec, int bitsPerSample) {
 }
 
 AVCodecID PacketForm(const Container& container, AVCodecID codec) {
-    if (container.subtitles == nullptr)
-        return AV_CODEC_ID_NONE;
     const AVCodecDescriptor* descriptor = avcodec_descriptor_get(codec);
-    if (descriptor == nullptr || descriptor->type != AVMEDIA_TYPE_SUBTITLE)
+    if (descriptor != nullptr && descriptor->type == AVMEDIA_TYPE_AUDIO && container.copiedSound != nullptr)
+        return av_match_list(descriptor->name, container.copiedSound, ',') > 0 ? codec : AV_CODEC_ID_NONE;
+    if (descriptor == nullptr || descriptor->type != AVMEDIA_TYPE_SUBTITLE || container.subtitles == nullptr)
         return AV_CODEC_ID_NONE;
     if (av_match_list(descriptor->name, container.subtitles, ',') > 0)
         return codec;
@@ -283,6 +296,15 @@ const Carriage& FindCarriage(const Container& container, uint32_t codec) {
         return carriage.container == container.code && carriage.codec == codec;
     });
     return found == kCarriages.end() ? kUsual : *found;
+}
+
+const Carriage& FindCarriage(const Container& container, AVCodecID soundCodec) {
+    const auto* codec = std::find_if(kSoundCodecs.begin(), kSoundCodecs.end(),
+                                     [&](const SoundCodec& row) { return row.id == soundCodec; });
+    const uint32_t code = codec != kSoundCodecs.end()      ? codec->code
+                          : soundCodec == AV_CODEC_ID_EAC3 ? kEac3
+                                                           : 0;
+    return FindCarriage(container, code);
 }
 
 uint32_t FormatTraits(uint32_t code) {

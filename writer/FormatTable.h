@@ -94,6 +94,8 @@ struct Container {
     uint32_t carries;    ///< kWriterFormat... of what goes in beside pictures and sound.
     /// FFmpeg's names of the codecs for subtitles that fit, that for any text first; null for none.
     const char* subtitles;
+    /// FFmpeg's names of the codecs for sound whose packets fit as they are; null for none.
+    const char* copiedSound;
     bool tagsInStream;              ///< Texts about the movie belong to its stream.
     std::array<uint32_t, 12> video; ///< Codes of the codecs that fit, the default first, then zeros.
     std::array<uint32_t, 12> audio;
@@ -123,6 +125,7 @@ AVCodecID PacketForm(const Container& container, AVCodecID codec);
 
 /// How the container carries the codec.
 const Carriage& FindCarriage(const Container& container, uint32_t codec);
+const Carriage& FindCarriage(const Container& container, AVCodecID soundCodec);
 
 /// kWriterFormat... of the format; 0 when the code is not in the table.
 uint32_t FormatTraits(uint32_t code);

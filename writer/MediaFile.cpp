@@ -98,7 +98,7 @@ void MediaFile::OpenStages() {
             FindCarriage(*plan_.container, plan_.sound->codec->code), record_->ExtraParts()->sound);
     }
     for (const TrackPlan& track : plan_.tracks)
-        beside_.Add(track, *plan_.container, flags, part_.Streams());
+        beside_.Add(track, *plan_.container, flags, record_->Sequence() == 1, part_.Streams());
     record_->Update([&](WriterStatus& status) {
         if (pictures_) {
             status.nWidth = pictures_->Encoder().width;
@@ -136,7 +136,7 @@ bool MediaFile::WriteVideo(const VideoImage& image) {
     const int64_t time = begin + stamps_.AddPicture(image.llTime);
     if (!firstPicture_) {
         firstPicture_ = time;
-        sourceBegin_ = SourceTime(image.reserved);
+        pictureSource_ = SourceTime(image.reserved);
     }
     const bool isAhead = plan_.pictures->end && time >= *plan_.pictures->end; // of a piece, and not in it
     record_->Update([&](WriterStatus& status) {
@@ -160,7 +160,7 @@ bool MediaFile::WriteVideo(const VideoImage& image) {
 
 bool MediaFile::WriteAudio(const AudioFrame& frame) {
     const PcmFormat format = FormatOf(frame);
-    if (!sound_ || frame.nLength <= 0 || record_->Failed())
+    if (!HearsSound() || frame.nLength <= 0 || record_->Failed())
         return false;
     if (!format.Valid() || frame.pData == nullptr) {
         refusedSound_ = true;
@@ -175,8 +175,8 @@ bool MediaFile::WriteAudio(const AudioFrame& frame) {
 }
 
 bool MediaFile::AddSound(const AudioFrame& frame, const PcmFormat& format) {
-    if (!plan_.pictures && !sourceBegin_)
-        sourceBegin_ = SourceTime(frame.reserved);
+    if (stamps_.SoundLength() == 0)
+        soundSource_ = SourceTime(frame.reserved);
     stamps_.AddSound(frame.llTime, frame.nLength, format.BytesPerSecond(), frame.nType == kMediaTypeSilence);
     record_->Update([&](WriterStatus& status) {
         status.llSamplesReceived += frame.nLength / format.BytesPerFrame();
@@ -186,6 +186,8 @@ bool MediaFile::AddSound(const AudioFrame& frame, const PcmFormat& format) {
         StartBeside();
         beside_.Reach(EndInSource());
     }
+    if (!sound_)
+        return true;
     if (waiting_.empty() || !(waiting_.back().format == format))
         waiting_.push_back({format, {}});
     std::vector<uint8_t>& data = waiting_.back().data;
@@ -198,22 +200,24 @@ bool MediaFile::AddSound(const AudioFrame& frame, const PcmFormat& format) {
 
 /// Once it is known where the file begins in the source.
 void MediaFile::StartBeside() {
-    if (beside_.Empty() || beside_.Started())
+    if (beside_.Empty() || beside_.Started() || (HearsSound() && !stamps_.SoundStart()))
         return;
     beside_.Start(
         SourceBegin(), [this](AVPacket& packet, int stream) { part_.Write(packet, stream); },
         [this](const std::exception_ptr& error) { Fail(error); });
 }
 
-/// The source's time at time 0 of the file; the source's time is the file's where the host tells none.
+/// The source's time at time 0 of the file; the source's time is the file's where the host tells none. Sound
+/// tells it better than a first picture, which may have come before it.
 int64_t MediaFile::SourceBegin() const {
-    const int64_t start = firstPicture_ ? *firstPicture_ : stamps_.SoundStart().value_or(0);
-    return sourceBegin_ ? *sourceBegin_ - start : 0;
+    if (soundSource_ && stamps_.SoundStart())
+        return *soundSource_ - *stamps_.SoundStart();
+    return pictureSource_ ? *pictureSource_ - firstPicture_.value_or(0) : 0;
 }
 
 /// Where the file ends in the source as it stands: with its sound, or without any with its pictures.
 int64_t MediaFile::EndInSource() const {
-    if (sound_ && stamps_.SoundLength() > 0)
+    if (HearsSound() && stamps_.SoundLength() > 0)
         return SourceBegin() + stamps_.SoundStart().value_or(0) + stamps_.SoundLength();
     const double pictures = record_->Snapshot().dVideoReceived;
     return SourceBegin() + firstPicture_.value_or(0) + std::llround(pictures * kTicksPerSecond);
@@ -322,6 +326,8 @@ bool MediaFile::Empty() const {
 void MediaFile::DrainStages() {
     try {
         stamps_.Finish();
+        if (!Empty())
+            StartBeside();
         if ((!waiting_.empty() || (plan_.sound && plan_.sound->neverEmpty)) && !record_->Failed()) {
             StartSoundIfKnown();
             PushSound();
@@ -339,6 +345,8 @@ void MediaFile::DrainStages() {
     if (sound_)
         sound_->Join();
     beside_.Join();
+    if (plan_.soundBeside) // what came was made longer than the track, which has no silence
+        record_->Update([this](WriterStatus& status) { status.dAudioReceived = beside_.Seconds(); });
 }
 
 } // namespace writer

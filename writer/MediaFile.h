@@ -66,6 +66,7 @@ private:
     void DrainStages();
     int Conclude();
     bool Empty() const;
+    bool HearsSound() const { return sound_ || plan_.soundBeside; }
     void StartBeside();
     int64_t SourceBegin() const;
     int64_t EndInSource() const;
@@ -86,9 +87,9 @@ private:
     bool soundStarted_ = false;
     bool refusedPictures_ = false; ///< Some made no sense.
     bool refusedSound_ = false;
-    std::optional<int64_t> firstPicture_; ///< Its time in the file.
-    std::optional<int64_t>
-        sourceBegin_; ///< Where the first picture, or the sound alone, stood in the source.
+    std::optional<int64_t> firstPicture_;  ///< Its time in the file.
+    std::optional<int64_t> pictureSource_; ///< Where it stood in the source,
+    std::optional<int64_t> soundSource_;   ///< and where the first sound did.
     std::unique_ptr<PictureStage> pictures_;
     std::unique_ptr<SoundStage> sound_;
     BesideStage beside_;

@@ -6,10 +6,16 @@
 #include "writer/FileRecord.h"
 #include "writer/WriterFailure.h"
 
+extern "C" {
+#include <libavutil/intreadwrite.h>
+}
+
 #include <algorithm>
 #include <array>
+#include <cstdlib>
 #include <cstring>
 #include <limits>
+#include <optional>
 #include <string>
 #include <utility>
 
@@ -47,8 +53,9 @@ protected:
         packet.pts = packet.dts = av_rescale_q(begin, kTick, unit_);
         packet.duration = av_rescale_q(begin + duration, kTick, unit_) - packet.pts;
         packet.flags |= AV_PKT_FLAG_KEY;
-        take_(packet);
+        HandOn(packet);
     }
+    void HandOn(AVPacket& packet) { take_(packet); }
 
     const Track& track_;
     const AVRational unit_;
@@ -58,16 +65,10 @@ private:
     PacketTaker take_;
 };
 
-bool IsSound(const Track& track) {
-    return track.parameters->codec_type == AVMEDIA_TYPE_AUDIO;
-}
-
-/// Packets as they are.
+/// Subtitles as they are.
 class CopiedPackets final : public PacketTrack {
 public:
-    explicit CopiedPackets(const Track& track)
-        : PacketTrack(track,
-                      IsSound(track) ? AVRational{1, std::max(track.parameters->sample_rate, 1)} : kCueUnit) {
+    explicit CopiedPackets(const Track& track) : PacketTrack(track, kCueUnit) {
         av::CheckMemory(avcodec_parameters_copy(parameters_.get(), track.parameters.get()));
     }
 
@@ -89,6 +90,69 @@ private:
         constexpr int kLengthField = 2;
         return parameters_->codec_id == AV_CODEC_ID_MOV_TEXT && packet.size <= kLengthField;
     }
+};
+
+/// Sound as it is, behind each other to the sample.
+class CopiedSound final : public PacketTrack {
+public:
+    CopiedSound(const Track& track, const Container& container, bool isFirst)
+        : PacketTrack(track, {1, std::max(track.parameters->sample_rate, 1)}),
+          carriage_(FindCarriage(container, track.parameters->codec_id)) {
+        av::CheckMemory(avcodec_parameters_copy(parameters_.get(), track.parameters.get()));
+        if (!isFirst)
+            parameters_->initial_padding = 0;
+        if (parameters_->codec_id == AV_CODEC_ID_OPUS)
+            TellRunUp();
+        const int* rates = carriage_.sampleRates;
+        while (rates != nullptr && *rates != 0 && *rates != parameters_->sample_rate)
+            ++rates;
+        if (rates != nullptr && *rates == 0)
+            throw WriterFailure(kWriterErrorCodec, std::string(container.name) + " cannot carry sound of " +
+                                                       std::to_string(parameters_->sample_rate) +
+                                                       " Hz of this codec.");
+    }
+
+    MuxedStream Stream() const override {
+        return {parameters_.get(), unit_,        {0, 1}, {0, 1}, parameters_->initial_padding,
+                &carriage_,        &track_.label};
+    }
+
+    bool Take(const WriterTrackItem& item, int64_t time) override {
+        const av::Packet packet(av_packet_clone(item.pPacket));
+        if (!packet)
+            throw std::bad_alloc();
+        const int64_t begin = av_rescale_q(time, kTick, unit_);
+        const bool follows = end_ && std::abs(begin - *end_) <= kRounding;
+        packet->pts = packet->dts =
+            follows ? *end_ : std::max<int64_t>(begin, -int64_t{parameters_->initial_padding});
+        packet->duration = av_rescale_q(item.llDuration, kTick, unit_);
+        first_ = first_.value_or(packet->pts);
+        end_ = packet->pts + packet->duration;
+        HandOn(*packet);
+        return true;
+    }
+
+    double Seconds() const override {
+        const int64_t samples = end_ ? *end_ - *first_ - parameters_->initial_padding : 0;
+        return static_cast<double>(std::max<int64_t>(0, samples)) * av_q2d(unit_);
+    }
+
+private:
+    static constexpr int64_t kRounding = 2; // samples
+
+    /// Its header tells it as well.
+    void TellRunUp() {
+        constexpr int kField = 10;
+        constexpr int kRate = 48000;
+        if (parameters_->extradata_size >= kField + 2)
+            AV_WL16(parameters_->extradata + kField,
+                    static_cast<uint16_t>(
+                        av_rescale(parameters_->initial_padding, kRate, parameters_->sample_rate)));
+    }
+
+    const Carriage& carriage_;
+    std::optional<int64_t> first_; // where the first packet begins
+    std::optional<int64_t> end_;   // of the last one
 };
 
 struct SubtitleFree {
@@ -227,7 +291,9 @@ private:
 
 } // namespace
 
-std::unique_ptr<BesideTrack> MakePacketTrack(const Track& track, const Container& container) {
+std::unique_ptr<BesideTrack> MakePacketTrack(const Track& track, const Container& container, bool isFirst) {
+    if (IsSound(track))
+        return std::make_unique<CopiedSound>(track, container, isFirst);
     const AVCodecID target = PacketForm(container, track.parameters->codec_id);
     if (target == track.parameters->codec_id)
         return std::make_unique<CopiedPackets>(track);

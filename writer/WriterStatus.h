@@ -188,6 +188,9 @@ typedef struct WriterOptions {
     int64_t llPieceEnd;  ///< The first picture of the piece that follows, -1 for the last one. Pictures from
                          ///< there on are only looked at, see MWPicturesAhead.
     int64_t llPieceTick; ///< As MWPlanTicks tells it for the piece's first picture.
+    /// Nonzero: the sound that is written tells how long files are and does not go into them. Their sound are
+    /// tracks (MWAddTrack).
+    int32_t bSoundBeside;
 } WriterOptions;
 
 /// What a piece holds.
@@ -284,11 +287,13 @@ typedef struct WriterTrack {
     /// Sound to encode with the codec of EncodeParam, as it is to be in the file: samples per second,
     /// channels, bits a sample, bits per second. 0 for packets, which have parameters instead.
     int32_t nSampleRate;
-    int32_t nChannels;                           ///< Likewise.
-    int32_t nBitsPerSample;                      ///< Likewise.
-    int32_t nBitrate;                            ///< Likewise; 0 or less: as in EncodeParam.
-    const struct AVCodecParameters* pParameters; ///< FFmpeg's, of the version that the writer uses; or null.
-    WriterTrackReader pfnNext;                   ///< Asked for its items.
+    int32_t nChannels;      ///< Likewise.
+    int32_t nBitsPerSample; ///< Likewise.
+    int32_t nBitrate;       ///< Likewise; 0 or less: as in EncodeParam.
+    /// FFmpeg's, of the version that the writer uses; or null. Of sound, `initial_padding` tells the samples
+    /// that decoders leave out at the begin of the set's first file.
+    const struct AVCodecParameters* pParameters;
+    WriterTrackReader pfnNext; ///< Asked for its items.
     void* pContext; ///< Its first argument. Both have to last until the last file of the set is closed.
 } WriterTrack;
 
@@ -296,8 +301,8 @@ typedef struct WriterTrack {
 /// leave out sound, formats that do not carry the codec (MWCarriesPackets) packets.
 int MWAddTrack(uint32_t set, const WriterTrack* track);
 
-/// 1 when files of the format carry packets of the codec with that name of FFmpeg's as a track: as they are,
-/// or subtitles of text as other ones. Else 0.
+/// 1 when files of the format carry packets of the codec with that name of FFmpeg's as a track: sound and
+/// subtitles as they are, or subtitles of text as other ones. Else 0.
 int MWCarriesPackets(uint32_t format, const char* codec);
 
 /// A chapter, in the source's time (100 ns units). Each file gets what lies in it, on its own timeline, when

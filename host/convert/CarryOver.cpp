@@ -93,6 +93,16 @@ std::string WhySubtitlesStay(const StreamInfo& stream, const FileFormatInfo& for
     return fmt::format("{} cannot hold them{}", NameOf(format), matroskaCan ? ", MKV can" : "");
 }
 
+/// What `read` gives, with its errors as failures.
+template <class Function>
+auto& Opened(Function read) {
+    try {
+        return read();
+    } catch (const SourceError& error) {
+        throw Failure(Category::kRequest, error.what());
+    }
+}
+
 /// Adds the tracks that are read beside what the engine converts.
 class FurtherTracks {
 public:
@@ -102,19 +112,25 @@ public:
     }
 
     void AddSound(const StreamInfo& stream) {
+        if (request_.copySound) {
+            CopiedSound& sound = movie_.CopySoundBeside(stream.index);
+            tracks_.push_back({{}, &sound, stream, &sound});
+            return;
+        }
         const SoundPlan plan = PlanSound(request_, format_, *stream.sound);
         WriterTrack track{};
         track.nSampleRate = plan.sampleRate.value_or(stream.sound->sampleRate);
         track.nChannels = plan.channels.value_or(stream.sound->channels);
         track.nBitsPerSample = stream.sound->bitsPerSample;
         track.nBitrate = plan.rate.value_or(0);
-        Add(track, movie_.ReadSoundBeside(stream.index), stream);
+        tracks_.push_back({track, &movie_.ReadSoundBeside(stream.index), stream});
     }
 
     /// Returns why not, or nothing.
     std::optional<NotCarried> AddFile(const SubtitleFileWish& wish, const std::string& charset) {
         const AVStream* described = nullptr;
-        BesidePackets& source = ReadFile(wish, charset, described);
+        BesidePackets& source = Opened(
+            [&]() -> BesidePackets& { return movie_.ReadSubtitleFile(wish.path, charset, described); });
         StreamInfo stream;
         stream.kind = StreamKind::kSubtitles;
         stream.codec = avcodec_get_name(described->codecpar->codec_id);
@@ -123,39 +139,44 @@ public:
             return NotCarried{"subtitles", std::nullopt, stream.codec, stream.language, std::move(reason)};
         WriterTrack track{};
         track.pParameters = described->codecpar;
-        Add(track, source, stream);
+        tracks_.push_back({track, &source, stream});
         return std::nullopt;
     }
 
     void AddPackets(const StreamInfo& stream) {
         WriterTrack track{};
         track.pParameters = movie_.StreamOf(stream.index).codecpar;
-        Add(track, movie_.ReadPacketsBeside(stream.index), stream);
+        tracks_.push_back({track, &movie_.ReadPacketsBeside(stream.index), stream});
     }
 
-private:
-    BesidePackets& ReadFile(const SubtitleFileWish& wish, const std::string& charset,
-                            const AVStream*& stream) {
-        try {
-            return movie_.ReadSubtitleFile(wish.path, charset, stream);
-        } catch (const SourceError& error) {
-            throw Failure(Category::kRequest, error.what());
+    /// Hands them to the writer: only now, since what is copied is described by its first packets.
+    void Finish() {
+        int number = kWriterTrackFurther;
+        for (Track& each : tracks_) {
+            if (each.copied != nullptr)
+                each.track.pParameters = &Opened(
+                    [&]() -> const AVCodecParameters& { return movie_.DescribeCopied(*each.copied); });
+            each.track.pfnNext = TakeNext;
+            each.track.pContext = each.source;
+            if (MWAddTrack(set_, &each.track) == 0)
+                throw std::bad_alloc();
+            LabelTrack(each.stream, request_, set_, number++);
         }
     }
 
-    void Add(WriterTrack& track, BesideTrack& source, const StreamInfo& stream) {
-        track.pfnNext = TakeNext;
-        track.pContext = &source;
-        if (MWAddTrack(set_, &track) == 0)
-            throw std::bad_alloc();
-        LabelTrack(stream, request_, set_, kWriterTrackFurther + count_++);
-    }
+private:
+    struct Track {
+        WriterTrack track;
+        BesideTrack* source;
+        StreamInfo stream;
+        CopiedSound* copied = nullptr;
+    };
 
     Movie& movie_;
     const Request& request_;
     const FileFormatInfo& format_;
     const uint32_t set_;
-    int count_ = 0;
+    std::vector<Track> tracks_;
 };
 
 bool BelongTogether(const StreamInfo& one, const StreamInfo& other) {
@@ -165,13 +186,16 @@ bool BelongTogether(const StreamInfo& one, const StreamInfo& other) {
 }
 
 /// Why a stream of sound beside the engine's stays behind; empty when it does not.
-std::string WhySoundStays(const SourceInfo& source, const StreamInfo& stream, const FileFormatInfo& format) {
+std::string WhySoundStays(const SourceInfo& source, const StreamInfo& stream, const FileFormatInfo& format,
+                          bool copies) {
     if (format.bHasAudio == 0)
         return fmt::format("{} cannot hold it", NameOf(format));
     if ((MWGetFormatTraits(format.fccFormat) & kWriterFormatTracks) == 0)
         return fmt::format("{} holds one track of sound, MKV and MP4 hold several", NameOf(format));
     if (!stream.decodable || !stream.sound || stream.sound->sampleRate <= 0 || stream.sound->channels <= 0)
         return "it cannot be decoded";
+    if (copies && MWCarriesPackets(format.fccFormat, stream.codec.c_str()) == 0)
+        return fmt::format("{} cannot hold it as it is", NameOf(format));
     if (source.pictures && !BelongTogether(StreamAt(source, source.pictures->index), stream))
         return "it belongs to another programme";
     return {};
@@ -210,7 +234,7 @@ struct Chosen {
 
 /// Empty when the format can hold the stream, or it is of a kind of which the source itself tells.
 std::string WhyItStays(const SourceInfo& source, const Chosen& chosen, const StreamInfo& stream,
-                       const FileFormatInfo& format) {
+                       const FileFormatInfo& format, bool copies) {
     const uint32_t traits = MWGetFormatTraits(format.fccFormat);
     switch (stream.kind) {
     case StreamKind::kPictures:
@@ -219,7 +243,7 @@ std::string WhyItStays(const SourceInfo& source, const Chosen& chosen, const Str
     case StreamKind::kSound:
         if (format.bHasAudio != 0 && (chosen.sound < 0 || chosen.sound == stream.index))
             return {};
-        return WhySoundStays(source, stream, format);
+        return WhySoundStays(source, stream, format, copies);
     case StreamKind::kSubtitles:
         return WhySubtitlesStay(stream, format);
     case StreamKind::kData:
@@ -282,7 +306,8 @@ std::vector<int> FurtherSound(const SourceInfo& source, const Request& request,
     const std::vector<int> wanted = WantedTracks(source.streams, StreamKind::kSound, request.audioTracks);
     for (const StreamInfo& stream : source.streams)
         if (source.sound && IsAmong(wanted, stream.index) && stream.kind == StreamKind::kSound &&
-            stream.index != source.sound->index && WhySoundStays(source, stream, format).empty())
+            stream.index != source.sound->index &&
+            WhySoundStays(source, stream, format, request.copySound).empty())
             further.push_back(stream.index);
     return further;
 }
@@ -299,6 +324,8 @@ std::vector<NotCarried> CarryOver(Movie& movie, const Request& request, const Fi
             left.push_back(
                 {"chapters", std::nullopt, {}, {}, fmt::format("{} of them have no length", wrong)});
     FurtherTracks tracks(movie, request, format, writerSet);
+    if (request.copySound && source.sound && format.bHasAudio != 0)
+        tracks.AddSound(StreamAt(source, source.sound->index));
     for (const int stream : FurtherSound(source, request, format))
         tracks.AddSound(StreamAt(source, stream));
     const Chosen chosen = ChosenOf(source, request);
@@ -308,11 +335,12 @@ std::vector<NotCarried> CarryOver(Movie& movie, const Request& request, const Fi
     for (const SubtitleFileWish& wish : request.subtitleFiles)
         if (std::optional<NotCarried> stays = tracks.AddFile(wish, request.subtitleCharset))
             left.push_back(std::move(*stays));
+    tracks.Finish();
     bool hasCover = false;
     for (const StreamInfo& stream : source.streams) {
         if (!chosen.Wants(stream))
             continue;
-        std::string reason = WhyItStays(source, chosen, stream, format);
+        std::string reason = WhyItStays(source, chosen, stream, format, request.copySound);
         if (reason.empty())
             reason = CarryStored(movie, stream, writerSet, hasCover);
         if (!reason.empty())
@@ -337,7 +365,8 @@ std::vector<NotCarried> ForetellLeftBehind(const SourceInfo& source, const Reque
             left.push_back(*std::move(chapters));
         for (const StreamInfo& stream : source.streams)
             if (chosen.Wants(stream))
-                if (std::string reason = WhyItStays(source, chosen, stream, format); !reason.empty())
+                if (std::string reason = WhyItStays(source, chosen, stream, format, request.copySound);
+                    !reason.empty())
                     left.push_back(LeftOf(stream, std::move(reason)));
         for (const SubtitleFileWish& wish : request.subtitleFiles) {
             StreamInfo stream;

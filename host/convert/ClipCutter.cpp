@@ -1,6 +1,7 @@
 #include "host/convert/ClipCutter.h"
 
 #include "host/source/MediaTime.h"
+#include "host/source/SourceTime.h"
 
 #include <algorithm>
 #include <limits>
@@ -150,6 +151,7 @@ AudioFrame* ClipCutter::CutSound::GetNextFrame() {
     block_.nLength = static_cast<int32_t>(samples * frameBytes);
     block_.nDuration = static_cast<int32_t>(owner_.Duration(samples));
     block_.llTime = block_.llTime2 = owner_.soundTime_ - owner_.base_;
+    TellSourceTime(block_.reserved, owner_.soundTime_); // it may be the rest of a block
     left.pData += block_.nLength;
     left.nLength -= block_.nLength;
     left.nBufferSize -= block_.nLength;

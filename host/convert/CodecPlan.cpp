@@ -136,6 +136,8 @@ std::optional<uint32_t> ChooseVideoCodec(const Request& request, const FileForma
 }
 
 std::optional<uint32_t> ChooseAudioCodec(const Request& request, const FileFormatInfo& format) {
+    if (request.copySound)
+        return std::nullopt;
     return ChooseCodec(request.audioCodec, request.preferences.audioCodecs, format, true);
 }
 
@@ -179,6 +181,8 @@ bool HasRates(const Request& request, const FileFormatInfo& format, const Source
 SoundPlan PlanSound(const Request& request, const FileFormatInfo& format, const SoundStreamInfo& source) {
     const Preferences& preferences = request.preferences;
     SoundPlan plan;
+    if (request.copySound)
+        return plan;
     plan.codec = ChooseAudioCodec(request, format);
     plan.channels = request.channels ? request.channels : preferences.channels;
     if (!plan.channels && preferences.maxChannels && source.channels > *preferences.maxChannels)

@@ -4,9 +4,11 @@
 #include "host/convert/Failure.h"
 #include "host/convert/Formats.h"
 #include "media/Limits.h"
+#include "media/MediaWriter.h"
 #include "writer/WriterStatus.h"
 
 #include <algorithm>
+#include <cstdint>
 #include <filesystem>
 #include <fmt/format.h>
 
@@ -51,6 +53,27 @@ void PutSound(EncodeParam& param, const FileFormatInfo& format, const Request& r
     param.nBitsPerSample = source.bitsPerSample;
 }
 
+/// Throws Failure where files of the format cannot hold the sound as it is coded.
+void RequireCopyable(const FileFormatInfo& format, const Request& request, const StreamInfo& sound,
+                     bool withPictures) {
+    constexpr double kLate = 0.1; // seconds
+    const std::string name = CodeName(format.fccFormat);
+    if (MWCarriesPackets(format.fccFormat, sound.codec.c_str()) == 0) {
+        std::string others;
+        for (const FileFormatInfo* other = MWGetFileFormatInfos(); other->fccFormat != 0; ++other)
+            if (MWCarriesPackets(other->fccFormat, sound.codec.c_str()) != 0)
+                others += (others.empty() ? "" : ", ") + CodeName(other->fccFormat);
+        throw Failure(Category::kRequest,
+                      fmt::format("{} cannot hold \"{}\" sound as it is; {}", name, sound.codec,
+                                  others.empty() ? "no format can" : others + " can"));
+    }
+    const double late = sound.begin.value_or(0) - request.begin;
+    if (withPictures && late > kLate && (MWGetFormatTraits(format.fccFormat) & kWriterFormatSteadyRate) != 0)
+        throw Failure(Category::kRequest,
+                      fmt::format("{} cannot begin the sound as it is {:.1f} s behind the pictures; MKV can",
+                                  name, late));
+}
+
 } // namespace
 
 const FileFormatInfo& ChooseFormat(const Request& request) {
@@ -88,6 +111,12 @@ EncodeParam PlanEncoding(const EncodeParam& defaults, const FileFormatInfo& form
         throw Failure(Category::kRequest,
                       fmt::format("{} carries nothing that \"{}\" holds; choose another format",
                                   format.szName, source.path));
+    }
+    if (request.copySound && param.bNoAudio == 0) {
+        const StreamInfo& sound = source.streams[static_cast<std::size_t>(source.sound->index)];
+        RequireCopyable(format, request, sound, param.bNoVideo == 0);
+        if (sound.bitRate > 0 && sound.bitRate < INT32_MAX) // for the estimate
+            param.nAudioBitrate = static_cast<int32_t>(sound.bitRate);
     }
     return param;
 }

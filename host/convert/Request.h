@@ -52,6 +52,7 @@ struct Request {
         format; ///< Four-character code; see Formats.h. By default the output's name tells.
     std::optional<uint32_t> videoCodec; ///< Likewise; by default the format's usual one.
     std::optional<uint32_t> audioCodec;
+    bool copySound = false; ///< Sound stays as it is coded, instead; its rates and channels are the source's.
     std::optional<Size> size;
     Fit fit = Fit::kBorders;
     std::optional<double> frameRate; ///< Pictures per second, up to 200.

@@ -201,6 +201,7 @@ void Asked(Archive& archive, Fields& request) {
     archive("format", request.format);
     archive("videoCodec", request.videoCodec);
     archive("audioCodec", request.audioCodec);
+    archive("copySound", request.copySound);
     archive("size", request.size);
     archive("fit", request.fit);
     archive("frameRate", request.frameRate);

@@ -4,6 +4,8 @@
 
 #include <algorithm>
 #include <cstdlib>
+#include <limits>
+#include <new>
 #include <utility>
 
 namespace movieconv {
@@ -24,15 +26,15 @@ constexpr int kProbedPackets = 2000;                   // read to find the pictu
 
 Demuxer::Demuxer(Source& source, Failures& failures) : source_(source), failures_(failures) {
     if (const auto& pictures = source.Info().pictures)
-        queues_[pictures->index];
+        queues_[{pictures->index}];
     if (const auto& sound = source.Info().sound)
-        queues_[sound->index].mayBeSilent = source.Info().pictures.has_value();
+        queues_[{sound->index}].mayBeSilent = source.Info().pictures.has_value();
 }
 
 void Demuxer::ReadBeside(const std::vector<int>& streams) {
     source_.Reader().SelectBeside(streams);
     for (const int stream : streams)
-        queues_[stream].beside = true;
+        queues_[{stream, true}];
 }
 
 Demuxer::~Demuxer() {
@@ -119,12 +121,12 @@ av::Packet Demuxer::Take(std::unique_lock<std::mutex>& lock, Queue& queue, Known
 
 av::Packet Demuxer::Take(int stream) {
     std::unique_lock lock(mutex_);
-    return Take(lock, queues_.at(stream), [] { return false; });
+    return Take(lock, queues_.at({stream}), [] { return false; });
 }
 
 std::variant<av::Packet, int64_t> Demuxer::TakeOrSilence(int stream) {
     std::unique_lock lock(mutex_);
-    Queue& queue = queues_.at(stream);
+    Queue& queue = queues_.at({stream});
     std::optional<int64_t> silence;
     av::Packet packet = Take(lock, queue, [&] { return (silence = Silence(queue)).has_value(); });
     if (packet || !silence)
@@ -147,8 +149,8 @@ std::optional<int64_t> Demuxer::Silence(const Queue& queue) const {
 /// How far the pictures and the sound that are converted have been read.
 int64_t Demuxer::Reached() const {
     int64_t reached = INT64_MIN + kLatest;
-    for (const auto& [stream, queue] : queues_)
-        if (!queue.beside)
+    for (const auto& [taker, queue] : queues_)
+        if (!taker.beside)
             reached = std::max(reached, queue.end.value_or(reached));
     return reached;
 }
@@ -161,7 +163,7 @@ bool Demuxer::IsAwaited(const Queue& queue) const {
 
 Demuxer::Beside Demuxer::TakeBeside(int stream, int64_t until, bool wait) {
     std::unique_lock lock(mutex_);
-    Queue& queue = queues_.at(stream);
+    Queue& queue = queues_.at({stream, true});
     if (wait && queue.packets.empty()) {
         Start();
         queue.wanted = until;
@@ -179,6 +181,24 @@ Demuxer::Beside Demuxer::TakeBeside(int stream, int64_t until, bool wait) {
     return {std::move(packet), false};
 }
 
+av::Packet Demuxer::FirstBeside(int stream) {
+    std::unique_lock lock(mutex_);
+    Queue& queue = queues_.at({stream, true});
+    Start();
+    queue.wanted = std::numeric_limits<int64_t>::max();
+    changed_.notify_all();
+    WaitAndTell(
+        changed_, lock, [&] { return stopping_ || ended_ || !queue.packets.empty() || Held() >= kMostBytes; },
+        L"Movie::What goes beside pictures and sound waits for the source");
+    queue.wanted = INT64_MIN;
+    if (queue.packets.empty())
+        return nullptr;
+    av::Packet packet(av_packet_clone(queue.packets.front().get()));
+    if (!packet)
+        throw std::bad_alloc();
+    return packet;
+}
+
 void Demuxer::Stop() {
     {
         const std::lock_guard lock(mutex_);
@@ -190,7 +210,7 @@ void Demuxer::Stop() {
 
 std::optional<int64_t> Demuxer::EndOf(int stream) const {
     const std::lock_guard lock(mutex_);
-    const auto found = queues_.find(stream);
+    const auto found = queues_.find({stream});
     return found != queues_.end() ? found->second.end : std::nullopt;
 }
 
@@ -201,7 +221,7 @@ int Demuxer::ClockJumps() const {
 
 std::size_t Demuxer::Held() const {
     std::size_t held = 0;
-    for (const auto& [stream, queue] : queues_)
+    for (const auto& [taker, queue] : queues_)
         held += queue.bytes;
     return held;
 }
@@ -215,11 +235,11 @@ std::size_t Demuxer::Bytes() const {
 bool Demuxer::Holds(std::size_t packets, std::size_t bytes) const {
     bool allFilled = true;
     std::size_t held = 0;
-    for (const auto& [stream, queue] : queues_) {
-        if (queue.beside ? IsAwaited(queue) : queue.packets.empty() && !Silence(queue))
+    for (const auto& [taker, queue] : queues_) {
+        if (taker.beside ? IsAwaited(queue) : queue.packets.empty() && !Silence(queue))
             return false;
-        allFilled = allFilled && (queue.beside || queue.packets.size() >= packets);
-        held += queue.beside ? 0 : queue.bytes;
+        allFilled = allFilled && (taker.beside || queue.packets.size() >= packets);
+        held += taker.beside ? 0 : queue.bytes;
     }
     return allFilled || held >= bytes;
 }
@@ -259,19 +279,30 @@ bool Demuxer::ReadOne() {
         return false;
     }
     failedReads_ = 0;
-    const auto found = queues_.find(packet->stream_index);
-    if (found == queues_.end())
+    const auto taken = queues_.find({packet->stream_index});
+    const auto beside = queues_.find({packet->stream_index, true});
+    if (taken == queues_.end() && beside == queues_.end())
         return true;
     RepairClock(*packet);
+    av::Packet copy(taken != queues_.end() && beside != queues_.end() ? av_packet_clone(packet.get())
+                                                                      : nullptr);
+    if (taken != queues_.end() && beside != queues_.end() && !copy)
+        throw std::bad_alloc();
     {
         const std::optional<int64_t> end = EndOf(*packet);
         const std::lock_guard lock(mutex_);
-        found->second.end = std::max(found->second.end, end); // nothing is less than any
-        found->second.bytes += static_cast<std::size_t>(packet->size);
-        found->second.packets.push_back(std::move(packet));
+        if (copy)
+            Enqueue(beside->second, std::move(copy), end);
+        Enqueue((taken != queues_.end() ? taken : beside)->second, std::move(packet), end);
     }
     changed_.notify_all();
     return true;
+}
+
+void Demuxer::Enqueue(Queue& queue, av::Packet packet, std::optional<int64_t> end) {
+    queue.end = std::max(queue.end, end); // nothing is less than any
+    queue.bytes += static_cast<std::size_t>(packet->size);
+    queue.packets.push_back(std::move(packet));
 }
 
 std::optional<int64_t> Demuxer::EndOf(const AVPacket& packet) const {

@@ -11,6 +11,7 @@
 #include "host/source/Source.h"
 #include "thread/Stall.h"
 
+#include <compare>
 #include <condition_variable>
 #include <deque>
 #include <map>
@@ -30,8 +31,13 @@ public:
     Demuxer(const Demuxer&) = delete;
     Demuxer& operator=(const Demuxer&) = delete;
 
-    /// Reads these streams beside the others, for TakeBeside. Only before everything else.
+    /// Reads these streams beside the others, for TakeBeside; also one that is read for Take, whose packets
+    /// both get. Only before everything else.
     void ReadBeside(const std::vector<int>& streams);
+
+    /// A copy of the first packet of a stream that is read beside the others, which stays to be taken; waits
+    /// for it. Null when there is none, or not within what is read ahead. Nothing can be sought afterwards.
+    av::Packet FirstBeside(int stream);
 
     /// Moves so far back that everything from `seconds` on can be decoded. Only before the first packet is
     /// taken; a second call with the same time does nothing, so that both decoders may ask. False when the
@@ -78,8 +84,13 @@ private:
         std::optional<int64_t> end;      // in media time, of what was read
         int64_t silentUntil = INT64_MIN; // told to the taker
         bool mayBeSilent = false;
-        bool beside = false;
         int64_t wanted = INT64_MIN; // up to there its taker waits for packets
+    };
+    struct Taker {
+        int stream;
+        bool beside = false;
+
+        auto operator<=>(const Taker&) const = default;
     };
 
     void Start();
@@ -89,6 +100,7 @@ private:
     std::optional<int64_t> Silence(const Queue& queue) const;
     int64_t Reached() const;
     bool IsAwaited(const Queue& queue) const;
+    void Enqueue(Queue& queue, av::Packet packet, std::optional<int64_t> end);
     std::size_t Held() const;
     bool AwaitDemand();
     bool ReadOne();
@@ -107,7 +119,7 @@ private:
 
     mutable std::mutex mutex_;
     std::condition_variable changed_;
-    std::map<int, Queue> queues_;
+    std::map<Taker, Queue> queues_;
     bool started_ = false;
     bool stopping_ = false;
     bool ended_ = false;

@@ -31,6 +31,7 @@ void Movie::EndPicturesAt(double seconds) {
 }
 
 void Movie::SetBounds(double begin, bool ends, bool isCut) {
+    begin_ = begin;
     bounds_.begin = ToMediaTime(begin);
     bounds_.ends = ends;
     bounds_.isCut = isCut;
@@ -55,6 +56,20 @@ BesidePackets& Movie::ReadPacketsBeside(int stream) {
     if (bounds_.begin > 0)
         made.Precede(std::move(EarlierCues()[stream]));
     return made;
+}
+
+CopiedSound& Movie::CopySoundBeside(int stream) {
+    auto track =
+        std::make_unique<CopiedSound>(source_.Reader(), StreamOf(stream), demuxer_, bounds_, failures_);
+    CopiedSound& made = *track;
+    AddBeside(stream, std::move(track));
+    return made;
+}
+
+const AVCodecParameters& Movie::DescribeCopied(CopiedSound& sound) {
+    if (Pictures() != nullptr || begin_ > 0) // as the decoders are going to
+        demuxer_.Seek(begin_);
+    return sound.Describe();
 }
 
 BesidePackets& Movie::ReadSubtitleFile(const std::string& path, const std::string& charset,

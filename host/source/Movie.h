@@ -3,6 +3,7 @@
 #define MOVIECONV_HOST_SOURCE_MOVIE_H
 
 #include "host/source/BesideTrack.h"
+#include "host/source/CopiedSound.h"
 #include "host/source/Demuxer.h"
 #include "host/source/Failures.h"
 #include "host/source/PictureDecoder.h"
@@ -56,6 +57,12 @@ public:
     BesideSound& ReadSoundBeside(int stream);
     BesidePackets& ReadPacketsBeside(int stream);
 
+    /// Likewise, of sound. Its Describe is for DescribeCopied to call.
+    CopiedSound& CopySoundBeside(int stream);
+
+    /// CopiedSound::Describe, for which reading begins: once all streams beside are known.
+    const AVCodecParameters& DescribeCopied(CopiedSound& sound);
+
     /// Subtitles of a file of their own, whose times are the movie's. `stream` is set to their description.
     BesidePackets& ReadSubtitleFile(const std::string& path, const std::string& charset,
                                     const AVStream*& stream);
@@ -104,6 +111,7 @@ private:
     std::unique_ptr<PictureStamps> stamps_; // instead of pictures_
     std::unique_ptr<SoundDecoder> sound_;
     BesideBounds bounds_;
+    double begin_ = 0;                                   // seconds
     std::map<int, std::vector<av::Packet>> earlierCues_; // by stream, from before the begin
     bool earlierCuesRead_ = false;
     std::vector<int> besideStreams_;

@@ -61,17 +61,24 @@ bool MovieReader::Rewind() {
     // In streams for broadcast the first time lies behind the first key picture, which is decoded earlier.
     if ((flags & AVFMT_TS_DISCONT) != 0 && toFirstByte())
         return true;
-    // By the stream that begins first, lest the others be skipped up to where the usual one begins.
+    // By the stream that begins first, lest the others be skipped up to where the usual one begins. What
+    // decoders leave out at the begin of sound lies before the time that the stream tells.
     const AVStream* first = nullptr;
-    const auto beginOf = [&](const AVStream* stream) {
-        return stream->start_time != AV_NOPTS_VALUE ? MediaTime(stream->start_time, stream->time_base) : 0;
+    const auto stampOf = [](AVStream* stream) {
+        const AVIndexEntry* entry = avformat_index_get_entry(stream, 0);
+        const int64_t start = stream->start_time != AV_NOPTS_VALUE ? stream->start_time : 0;
+        return entry != nullptr && entry->timestamp != AV_NOPTS_VALUE ? std::min(start, entry->timestamp)
+                                                                      : start;
     };
+    int64_t start = 0;
     for (const int index : selected_) {
-        const AVStream* stream = Context()->streams[index];
-        if (first == nullptr || beginOf(stream) < beginOf(first))
+        AVStream* stream = Context()->streams[index];
+        const int64_t stamp = stampOf(stream);
+        if (first == nullptr || av_compare_ts(stamp, stream->time_base, start, first->time_base) < 0) {
             first = stream;
+            start = stamp;
+        }
     }
-    const int64_t start = first->start_time != AV_NOPTS_VALUE ? first->start_time : 0;
     const int64_t earlier = start - av_rescale_q(1, {1, 1}, first->time_base);
     return avformat_seek_file(Context(), first->index, INT64_MIN, earlier, start, 0) >= 0 || toFirstByte();
 }

@@ -82,9 +82,18 @@ void AddEncoding(CLI::App& app, Options& options) {
               "Four-character code of the picture codec")
         ->type_name("CODE")
         ->group(group);
-    AddParsed(app, "--audio-codec", ParseCode, options.request.audioCodec,
-              "a code of up to four characters; see \"movieconv --list-formats\"",
-              "Four-character code of the sound codec")
+    const auto takeSound = [&options](const std::string& text) {
+        options.request.copySound = text == "copy";
+        options.request.audioCodec = options.request.copySound ? std::nullopt : ParseCode(text);
+        if (!options.request.copySound && !options.request.audioCodec)
+            throw CLI::ValidationError("--audio-codec",
+                                       fmt::format("\"{}\" is not copy or a code of up to four characters; "
+                                                   "see \"movieconv --list-formats\"",
+                                                   text));
+    };
+    app.add_option_function<std::string>(
+           "--audio-codec", takeSound,
+           "Four-character code of the sound codec, or copy to\nleave sound as it is coded")
         ->type_name("CODE")
         ->group(group);
     app.add_flag("--no-video", options.request.noVideo, "Leave the pictures out")->group(group);
@@ -445,6 +454,12 @@ void RequireSense(const Options& options) {
                                     options.request.audioRate || options.request.split))
         throw Failure(Category::kRequest, "--max-size chooses the rates of one file: it excludes --quality, "
                                           "--video-rate, --audio-rate and --split");
+    if (options.request.copySound &&
+        (options.request.channels || options.request.sampleRate || options.request.audioRate ||
+         options.request.audioMaxRate || options.request.maxSize))
+        throw Failure(Category::kRequest,
+                      "--audio-codec copy leaves sound as it is: it excludes --channels, --sample-rate, "
+                      "--audio-rate, --audio-max-rate and --max-size");
     if (options.request.quality && options.request.videoRate)
         throw Failure(Category::kRequest, "--quality and --video-rate exclude each other");
     if (options.request.length && *options.request.length < 0.001)
@@ -459,7 +474,8 @@ void ApplyPreset(Options& options) {
         Preset preset = LoadPreset(options.preset);
         Request& request = options.request;
         request.noVideo = request.noVideo || (preset.preferences.noVideo && !request.videoCodec);
-        request.noAudio = request.noAudio || (preset.preferences.noAudio && !request.audioCodec);
+        request.noAudio =
+            request.noAudio || (preset.preferences.noAudio && !request.audioCodec && !request.copySound);
         request.preferences = std::move(preset.preferences);
         options.complaints = std::move(preset.complaints);
     } catch (const PresetError& error) {

@@ -1,0 +1,277 @@
+#include "host/source/CopiedSound.h"
+
+#include "host/source/MediaTime.h"
+#include "host/source/SourceError.h"
+
+extern "C" {
+#include <libavcodec/bsf.h>
+#include <libavcodec/vorbis_parser.h>
+#include <libavutil/intreadwrite.h>
+}
+
+#include <algorithm>
+#include <array>
+#include <cstring>
+#include <new>
+#include <utility>
+
+namespace movieconv {
+namespace {
+
+/// Samples at 48 kHz in a packet of Opus, as its first bytes tell.
+int64_t OpusSamples(const AVPacket& packet) {
+    if (packet.size < 1)
+        return 0;
+    static constexpr std::array kSilk{480, 960, 1920, 2880};
+    static constexpr std::array kHybrid{480, 960};
+    static constexpr std::array kCelt{120, 240, 480, 960};
+    const unsigned config = packet.data[0] >> 3;
+    const int frame = config < 12   ? kSilk.at(config & 3U)
+                      : config < 16 ? kHybrid.at(config & 1U)
+                                    : kCelt.at(config & 3U);
+    const unsigned code = packet.data[0] & 3U;
+    const int many = packet.size > 1 ? packet.data[1] & 0x3F : 0;
+    return int64_t{frame} * (code == 0 ? 1 : code == 3 ? many : 2);
+}
+
+/// A FLAC header tells length and digest of all sound; of a part they are not known.
+void ForgetWhole(AVCodecParameters& parameters) {
+    constexpr int kHeaderSize = 34;
+    constexpr int kLength = 13; // its lower half, and four bytes behind
+    constexpr int kDigest = 18;
+    if (parameters.codec_id != AV_CODEC_ID_FLAC || parameters.extradata_size < kHeaderSize)
+        return;
+    parameters.extradata[kLength] &= 0xF0;
+    std::fill(parameters.extradata + kLength + 1, parameters.extradata + kDigest, uint8_t{0});
+    std::fill(parameters.extradata + kDigest, parameters.extradata + kHeaderSize, uint8_t{0});
+}
+
+bool HasAdtsHeader(const AVPacket& packet) {
+    return packet.size > 7 && packet.data[0] == 0xFF && (packet.data[1] & 0xF6) == 0xF0;
+}
+
+int64_t SampleBytes(const AVCodecParameters& parameters) {
+    const bool isPcm =
+        parameters.codec_id >= AV_CODEC_ID_FIRST_AUDIO && parameters.codec_id < AV_CODEC_ID_ADPCM_IMA_QT;
+    const int bits = av_get_exact_bits_per_sample(parameters.codec_id);
+    return isPcm && bits >= 8 ? int64_t{bits} / 8 * parameters.ch_layout.nb_channels : 0;
+}
+
+} // namespace
+
+/// Takes the headers off AAC from broadcasts, which carry in each packet what others tell once.
+class CopiedSound::Deframer {
+public:
+    /// Throws SourceError when `first` cannot be understood. `parameters` get what its header tells.
+    Deframer(AVCodecParameters& parameters, AVRational timeBase, const AVPacket& first) {
+        AVBSFContext* context = nullptr;
+        const AVBitStreamFilter* filter = av_bsf_get_by_name("aac_adtstoasc");
+        int result = filter == nullptr ? AVERROR_BSF_NOT_FOUND : av_bsf_alloc(filter, &context);
+        context_.reset(context);
+        if (result >= 0)
+            result = avcodec_parameters_copy(context_->par_in, &parameters);
+        if (result >= 0) {
+            context_->time_base_in = timeBase;
+            result = av_bsf_init(context_.get());
+        }
+        av::CheckMemory(result);
+        av::Packet packet(av_packet_clone(&first));
+        if (!packet)
+            throw std::bad_alloc();
+        size_t size = 0;
+        const uint8_t* told = nullptr;
+        if (result >= 0 && Filter(*packet))
+            told = av_packet_get_side_data(packet.get(), AV_PKT_DATA_NEW_EXTRADATA, &size);
+        if (told == nullptr)
+            throw SourceError("its sound has no form that could be copied; convert it instead");
+        parameters.extradata = static_cast<uint8_t*>(av_mallocz(size + AV_INPUT_BUFFER_PADDING_SIZE));
+        if (parameters.extradata == nullptr)
+            throw std::bad_alloc();
+        std::memcpy(parameters.extradata, told, size);
+        parameters.extradata_size = static_cast<int>(size);
+    }
+
+    /// False when the packet is damaged; its content is gone then.
+    bool Filter(AVPacket& packet) {
+        int result = av_bsf_send_packet(context_.get(), &packet);
+        if (result >= 0)
+            result = av_bsf_receive_packet(context_.get(), &packet);
+        av::CheckMemory(result);
+        return result >= 0;
+    }
+
+private:
+    struct Free {
+        void operator()(AVBSFContext* context) const { av_bsf_free(&context); }
+    };
+    std::unique_ptr<AVBSFContext, Free> context_;
+};
+
+void CopiedSound::VorbisParserFree::operator()(AVVorbisParseContext* parser) const {
+    av_vorbis_parse_free(&parser);
+}
+
+CopiedSound::CopiedSound(const MovieReader& reader, const AVStream& stream, Demuxer& demuxer,
+                         const BesideBounds& bounds, Failures& failures)
+    : BesideTrack(bounds, failures),
+      reader_(reader),
+      demuxer_(demuxer),
+      stream_(stream.index),
+      timeBase_(stream.time_base),
+      parameters_(avcodec_parameters_alloc()),
+      sampleBytes_(SampleBytes(*stream.codecpar)) {
+    if (!parameters_)
+        throw std::bad_alloc();
+    av::CheckMemory(avcodec_parameters_copy(parameters_.get(), stream.codecpar));
+}
+
+CopiedSound::~CopiedSound() = default;
+
+const AVCodecParameters& CopiedSound::Describe() {
+    const av::Packet first = demuxer_.FirstBeside(stream_);
+    const bool isPart = bounds_.begin > 0 || bounds_.ends || bounds_.isCut;
+    if (isPart)
+        ForgetWhole(*parameters_);
+    if (first && parameters_->codec_id == AV_CODEC_ID_AAC && parameters_->extradata_size == 0 &&
+        HasAdtsHeader(*first))
+        deframer_ = std::make_unique<Deframer>(*parameters_, timeBase_, *first);
+    if (parameters_->codec_id == AV_CODEC_ID_VORBIS)
+        vorbis_.reset(av_vorbis_parse_init(parameters_->extradata, parameters_->extradata_size));
+    parameters_->initial_padding = first && bounds_.begin == 0 ? static_cast<int>(RunUp(*first)) : 0;
+    return *parameters_;
+}
+
+/// The samples of the first packets that a decoder leaves out.
+int64_t CopiedSound::RunUp(const AVPacket& first) const {
+    constexpr int64_t kMost = 1 << 16;
+    size_t size = 0;
+    const uint8_t* skipped = av_packet_get_side_data(&first, AV_PKT_DATA_SKIP_SAMPLES, &size);
+    int64_t samples = skipped != nullptr && size >= 4 ? int64_t{AV_RL32(skipped)} : 0;
+    const int64_t early =
+        first.pts != AV_NOPTS_VALUE ? -SamplesAt(reader_.MediaTime(first.pts, timeBase_)) : 0;
+    if (samples == 0)
+        samples = parameters_->initial_padding > 0 ? parameters_->initial_padding : early;
+    return samples > 0 && samples <= kMost ? samples : 0;
+}
+
+bool CopiedSound::Find(int64_t until, bool closing, Item& item) {
+    const auto isBehind = [&](const Held& held) { return TimeOf(held.begin) >= until; };
+    while (pending_.empty() || !isBehind(pending_.back())) {
+        Demuxer::Beside taken = demuxer_.TakeBeside(stream_, until, closing);
+        if (!taken.packet)
+            break;
+        Hold(std::move(taken.packet));
+    }
+    if (pending_.empty() || isBehind(pending_.front()) || !Cut(pending_.front(), until, closing)) {
+        item.time = pending_.empty() ? until : std::min(until, TimeOf(pending_.front().begin));
+        return false;
+    }
+    const int64_t begin = TimeOf(current_.begin);
+    item = {nullptr, current_.packet.get(), begin, TimeOf(current_.begin + current_.samples) - begin};
+    return true;
+}
+
+/// Makes the first of the pending packets the current one, or what of it lies before the file's end. False
+/// when that is not known yet.
+bool CopiedSound::Cut(Held& first, int64_t until, bool closing) {
+    const bool mayBeCut = sampleBytes_ > 0 && until != BesideBounds::kOpen && (bounds_.isCut || bounds_.ends);
+    const int64_t most = mayBeCut ? SamplesAt(until) - first.begin : first.samples;
+    if (most >= first.samples) {
+        current_ = std::move(first);
+        pending_.pop_front();
+        return true;
+    }
+    if (!closing || most <= 0)
+        return false;
+    current_ = {av::Packet(av_packet_clone(first.packet.get())), first.begin, most};
+    if (!current_.packet)
+        throw std::bad_alloc();
+    const auto bytes = static_cast<int>(most * sampleBytes_);
+    current_.packet->size = bytes;
+    first.packet->data += bytes;
+    first.packet->size -= bytes;
+    first.begin += most;
+    first.samples -= most;
+    return true;
+}
+
+void CopiedSound::Hold(av::Packet packet) {
+    if (packet->size <= 0)
+        return;
+    if (deframer_ && HasAdtsHeader(*packet) && !deframer_->Filter(*packet))
+        return;
+    av_packet_shrink_side_data(packet.get(), AV_PKT_DATA_NEW_EXTRADATA, 0); // it has been told
+    Held held{std::move(packet), 0, 0};
+    held.samples = Samples(*held.packet);
+    if (!Place(held))
+        return;
+    // What is not to be heard is wanted as the run-up only.
+    const bool isHeard = (held.packet->flags & AV_PKT_FLAG_DISCARD) == 0;
+    if (!isHeard && (held.begin < -int64_t{parameters_->initial_padding} || held.begin >= 0))
+        return;
+    held.packet->flags &= ~AV_PKT_FLAG_DISCARD;
+    const int64_t begin = SamplesAt(bounds_.begin);
+    if (bounds_.begin > 0 && held.begin < begin) {
+        const int64_t early = begin - held.begin;
+        if (sampleBytes_ == 0 || early >= held.samples)
+            return;
+        held.packet->data += early * sampleBytes_;
+        held.packet->size -= static_cast<int>(early * sampleBytes_);
+        held.begin = begin;
+        held.samples -= early;
+    }
+    pending_.push_back(std::move(held));
+}
+
+/// False when the source has gone back to what it had given before.
+bool CopiedSound::Place(Held& held) {
+    std::optional<int64_t> stamp;
+    if (held.packet->pts != AV_NOPTS_VALUE)
+        stamp = reader_.MediaTime(held.packet->pts, timeBase_);
+    if (!timeline_) {
+        origin_ = SamplesAt(stamp.value_or(0));
+        const int64_t unit = av_rescale_q_rnd(1, timeBase_, {1, parameters_->sample_rate}, AV_ROUND_UP);
+        if (std::abs(origin_ + parameters_->initial_padding) <= unit) // the container has rounded it
+            origin_ = -parameters_->initial_padding;
+        timeline_.emplace(parameters_->sample_rate, 0);
+        timeline_->Place(std::nullopt, held.samples);
+        held.begin = origin_;
+        return true;
+    }
+    const int64_t before = timeline_->Position();
+    if (held.samples == 0) { // of unknown length: the stamp alone tells
+        held.begin = std::max(origin_ + before, SamplesAt(stamp.value_or(0)));
+        timeline_->FillTo(TimeOf(held.begin - origin_));
+        return true;
+    }
+    if (stamp)
+        *stamp -= TimeOf(origin_);
+    const SoundTimeline::Placement placement = timeline_->Place(stamp, held.samples);
+    held.begin = origin_ + before + placement.silence;
+    return placement.cut < held.samples;
+}
+
+/// How many a packet holds of all channels; 0 when that is not known exactly.
+int64_t CopiedSound::Samples(const AVPacket& packet) {
+    const AVRational unit{1, parameters_->sample_rate};
+    if (sampleBytes_ > 0)
+        return packet.size / sampleBytes_;
+    if (parameters_->codec_id == AV_CODEC_ID_OPUS)
+        return av_rescale_q(OpusSamples(packet), {1, 48000}, unit);
+    if (vorbis_)
+        return std::max(av_vorbis_parse_frame(vorbis_.get(), packet.data, packet.size), 0);
+    const bool isExact = av_cmp_q(timeBase_, unit) <= 0;
+    if (isExact && packet.duration > 0)
+        return av_rescale_q(packet.duration, timeBase_, unit);
+    return std::max(av_get_audio_frame_duration2(parameters_.get(), packet.size), 0);
+}
+
+int64_t CopiedSound::SamplesAt(int64_t time) const {
+    return av_rescale(time, parameters_->sample_rate, kTicksPerSecond);
+}
+
+int64_t CopiedSound::TimeOf(int64_t samples) const {
+    return av_rescale(samples, kTicksPerSecond, parameters_->sample_rate);
+}
+
+} // namespace movieconv
