@@ -2,6 +2,7 @@
 
 #include "host/convert/CodecPlan.h"
 #include "host/source/Languages.h"
+#include "host/source/MediaTime.h"
 #include "host/source/SourceError.h"
 #include "host/source/StreamChoice.h"
 #include "media/FourCC.h"
@@ -108,7 +109,8 @@ class FurtherTracks {
 public:
     FurtherTracks(Movie& movie, const Request& request, const FileFormatInfo& format, uint32_t set)
         : movie_(movie), request_(request), format_(format), set_(set) {
-        movie.SetBounds(request.begin, request.length.has_value(), request.split.has_value());
+        const double begin = request.firstClip ? ToSeconds(request.firstClip->begin) : request.begin;
+        movie.SetBounds(begin, request.length.has_value(), request.split.has_value());
     }
 
     void AddSound(const StreamInfo& stream) {

@@ -26,13 +26,25 @@ ClipCutter::ClipCutter(Movie& movie, double begin, std::optional<double> clipLen
       end_(begin_ + clipLength_.value_or(0)),
       soundTime_(begin_) {}
 
+void ClipCutter::BeginAt(int64_t base) {
+    Begin(base);
+    soundTime_ = base;
+    movie_.Pictures()->Seek(ToSeconds(base), 1);
+    if (movie_.Sound() != nullptr)
+        movie_.Sound()->Seek(ToSeconds(base));
+}
+
+void ClipCutter::Begin(int64_t base) {
+    base_ = base;
+    end_ = begin_ + ((base_ - begin_) / *clipLength_ + 1) * *clipLength_;
+    first_ = false;
+}
+
 bool ClipCutter::Next() {
     const bool reached = clipLength_ && picturesDone_ && movie_.TimeOfNextPicture().has_value();
     if (!reached || movie_.Pictures()->DecodeNext(1) < 1)
         return false;
-    base_ = movie_.Pictures()->GetCurrentImage()->llTime;
-    end_ = begin_ + ((base_ - begin_) / *clipLength_ + 1) * *clipLength_;
-    first_ = false;
+    Begin(movie_.Pictures()->GetCurrentImage()->llTime);
     picturesDone_ = false;
     movie_.EndFileAt(BesideBounds::kOpen);
     return true;
@@ -99,7 +111,7 @@ VideoSourceInfo* ClipCutter::CutPictures::GetVideoInfo() {
 }
 
 double ClipCutter::CutPictures::Seek(double seconds, int mode) {
-    return owner_.movie_.Pictures()->Seek(seconds, mode);
+    return owner_.first_ ? owner_.movie_.Pictures()->Seek(seconds, mode) : seconds;
 }
 
 VideoImage* ClipCutter::CutPictures::GetCurrentImage() {
@@ -131,7 +143,7 @@ AudioSourceInfo* ClipCutter::CutSound::GetAudioInfo() {
 }
 
 double ClipCutter::CutSound::Seek(double seconds) {
-    return owner_.movie_.Sound()->Seek(seconds);
+    return owner_.first_ ? owner_.movie_.Sound()->Seek(seconds) : seconds;
 }
 
 AudioFrame* ClipCutter::CutSound::GetNextFrame() {

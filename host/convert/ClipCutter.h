@@ -29,12 +29,19 @@ public:
     VideoDecoder* Pictures() { return clipLength_ ? &cutPictures_ : movie_.Pictures(); }
     AudioDecoder* Sound() { return clipLength_ && movie_.Sound() != nullptr ? &cutSound_ : movie_.Sound(); }
 
+    /// The first clip to be made is the one that begins with the picture of that stamp. Before the first
+    /// picture is taken.
+    void BeginAt(int64_t base);
+
     /// Goes on to the next clip, whose stamps begin at 0. False when there is none: every picture was handed
     /// out, or the clip was not taken to its end.
     bool Next();
 
     /// Seconds from the begin of the first clip to that of this one.
     double Offset() const;
+
+    /// Where this clip begins in the source, in media time.
+    int64_t Begin() const { return first_ ? begin_ : base_; }
 
 private:
     class CutPictures final : public VideoDecoder {
@@ -62,6 +69,7 @@ private:
         AudioFrame block_{};
     };
 
+    void Begin(int64_t base);
     int64_t SoundEnd();
     bool TakeSound();
     bool MakeSilence();

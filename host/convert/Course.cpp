@@ -8,7 +8,9 @@
 #include "host/convert/Room.h"
 #include "host/convert/SizePlan.h"
 #include "host/source/MediaTime.h"
+#include "text/FileNames.h"
 #include "text/Path.h"
+#include "text/Utf8.h"
 
 #include <algorithm>
 #include <cerrno>
@@ -18,6 +20,7 @@
 #include <filesystem>
 #include <fmt/format.h>
 #include <limits>
+#include <string_view>
 
 namespace movieconv {
 namespace {
@@ -58,9 +61,11 @@ Course::Course(const Request& request, Movie& movie, Wishes& wishes, Observer& o
       length_(LengthOf(request_, movie.Info())),
       clips_(movie, request.begin, request.split),
       watch_(request_, movie.Info(), wishes.bell),
-      files_(observer),
+      files_(observer, request.firstClip ? request.firstClip->number : 0),
       engine_(MakeEngine(request_, movie.Info(), clips_.Pictures(), clips_.Sound(), watch_.OptionSet())),
       clock_(WorkClock::Now()) {
+    if (request.firstClip)
+        clips_.BeginAt(request.firstClip->begin);
     if (request.piece && request.piece->pictures)
         movie.EndPicturesAt(ToSeconds(request.piece->until));
     else if (request.length)
@@ -85,14 +90,28 @@ Verdict Course::Run() {
         HasRates(request_, ChooseFormat(request_), movie_.Info()))
         WarnOfSmallRoom();
     clock_.Skip(WorkClock::Now());
-    RunEngine(request_.begin, request_.length.value_or(0));
+    if (request_.firstClip)
+        RunClip();
+    else
+        RunEngine(request_.begin, request_.length.value_or(0));
     while (GoesOn())
-        RunEngine(0, request_.length ? std::max(length_ - clips_.Offset(), kLeastLength) : 0);
+        RunClip();
     return Conclude();
+}
+
+/// A clip that is not the movie's first.
+void Course::RunClip() {
+    RunEngine(0, request_.length ? std::max(length_ - clips_.Offset(), kLeastLength) : 0);
 }
 
 /// One file: all of an output that is not split.
 void Course::RunEngine(double begin, double length) {
+    if (request_.split) {
+        files_.BeginsAt(clips_.Begin());
+        const std::string clip =
+            text::ClipName(std::string_view(request_.output), static_cast<std::size_t>(files_.Opened()));
+        MCSetOutputFile(engine_.get(), text::FromUtf8(clip).c_str());
+    }
     position_ = 0;
     outcome_ = kNone;
     if (MCStart(engine_.get(), begin, length, nullptr, OnProgress, this) != 0)

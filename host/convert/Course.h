@@ -49,6 +49,7 @@ private:
 
     static unsigned OnProgress(void* context, unsigned kind, unsigned value, uintptr_t info);
 
+    void RunClip();
     void RunEngine(double begin, double length);
     bool GoesOn();
     void AwaitResume();

@@ -4,8 +4,6 @@
 #include "host/convert/Failure.h"
 #include "text/Utf8.h"
 
-#include <cstdint>
-
 namespace movieconv {
 Engine MakeEngine(const Request& request, const SourceInfo& source, VideoDecoder* pictures,
                   AudioDecoder* sound, uint32_t writerSet) {
@@ -20,9 +18,6 @@ Engine MakeEngine(const Request& request, const SourceInfo& source, VideoDecoder
     MCSetOutputFile(engine.get(), text::FromUtf8(request.output).c_str());
     if (request.split && param.bNoVideo != 0)
         throw Failure(Category::kRequest, "a split needs pictures: sound alone is written as one file");
-    if (request.split)
-        MCSetSplitParam(engine.get(), 1,
-                        INT32_MAX);  // for the names: where a clip ends is said by the decoders
     MCEnableEvents(engine.get(), 0); // all that they tell comes by the callback, too
     return engine;
 }

@@ -75,7 +75,7 @@ bool FileLedger::Enter(const WriterWatch::News& news) {
     case kWriterEventOpened:
         ++opened_;
         finishing_.reset();
-        observer_.Opened({opened_, news.status.szPath, news.status.szTemporaryPath});
+        observer_.Opened({opened_, news.status.szPath, news.status.szTemporaryPath, begin_});
         break;
     case kWriterEventFinishing:
         finishing_ = news.status.dFinished;

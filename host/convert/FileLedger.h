@@ -14,7 +14,11 @@ namespace movieconv {
 
 class FileLedger {
 public:
-    explicit FileLedger(Observer& observer) : observer_(observer) {}
+    /// `number` files were opened before.
+    explicit FileLedger(Observer& observer, int number = 0) : observer_(observer), opened_(number) {}
+
+    /// Where the next clip begins in the source, in media time.
+    void BeginsAt(int64_t time) { begin_ = time; }
 
     /// Enters what the writer told and tells it. False when a file has failed for the first time.
     bool Enter(const WriterWatch::News& news);
@@ -42,7 +46,8 @@ private:
     void EnterClosed(const WriterWatch::News& news);
 
     Observer& observer_;
-    int opened_ = 0;
+    int opened_;
+    int64_t begin_ = 0; // of the file opened next
     std::vector<Entry> complete_;
     int64_t bytes_ = 0;
     std::optional<double> finishing_;

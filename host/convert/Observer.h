@@ -44,6 +44,7 @@ struct OpenedFile {
     int number; ///< From 1.
     std::string path;
     std::string temporaryPath; ///< Where the data is until the file is complete.
+    int64_t begin = 0; ///< Stamp of its first picture in the source where it is a clip, in media time.
 };
 
 struct ClosedFile {

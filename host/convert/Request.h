@@ -37,6 +37,12 @@ struct PieceCut {
     bool fromStart = false;      ///< The source can only be read from its start.
 };
 
+/// The clip with which a conversion into clips begins.
+struct ClipStart {
+    int number = 0;    ///< From 0.
+    int64_t begin = 0; ///< Stamp of its first picture, in media time.
+};
+
 struct SubtitleFileWish {
     std::string path;
     std::string language; ///< Of two or three letters; empty when it is not told.
@@ -91,6 +97,8 @@ struct Request {
     double begin = 0;             ///< Seconds.
     std::optional<double> length; ///< Seconds, at least 0.001; by default all the rest.
     std::optional<double> split;  ///< Seconds of each clip, 0.1 to 2000000; by default one file.
+
+    std::optional<ClipStart> firstClip; ///< The clips before it are there; by default the first.
 
     bool overwrite = false; ///< Whether a file that exists may be replaced.
     OnFull onFull = OnFull::kStop;

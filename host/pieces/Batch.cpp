@@ -1,17 +1,16 @@
 #include "host/pieces/Batch.h"
 
-#include "host/convert/Attempt.h"
 #include "host/convert/EncodePlan.h"
 #include "host/convert/Failure.h"
 #include "host/convert/Sources.h"
 #include "host/pieces/SettingsText.h"
 
 #include <algorithm>
-#include <chrono>
 #include <filesystem>
 #include <fmt/format.h>
 #include <map>
-#include <new>
+#include <memory>
+#include <thread>
 #include <unistd.h>
 #include <utility>
 
@@ -54,113 +53,36 @@ void Replace(std::string& text, const std::string& what, const std::string& by) 
         text.replace(at, what.size(), by);
 }
 
-} // namespace
-
 /// One movie being converted.
-class Batch::Task final : public Observer {
+class MovieErrand final : public Errand {
 public:
-    Task(Batch& batch, BatchJournal& journal, Movie movie, SourceMark source, Request request)
-        : batch_(batch),
+    MovieErrand(Outlet& news, BatchJournal& journal, std::string output, SourceMark source,
+                const std::string& settings)
+        : news_(news),
           journal_(journal),
-          movie_(std::move(movie)),
+          output_(std::move(output)),
           source_(std::move(source)),
-          job_(std::move(request), *this) {}
+          settings_(settings) {}
 
-    Job& Conversion() { return job_; }
-
-    /// Ends it; what is converted until then is not the whole movie.
-    void Stop() { job_.Stop(); }
-    const Movie& What() const { return movie_; }
-    Progress Latest() const {
-        const std::lock_guard lock(mutex_);
-        return latest_;
-    }
-    std::optional<Verdict> Ending() const {
-        const std::lock_guard lock(mutex_);
-        return ending_;
-    }
-
-    void Progressed(const Progress& news) override {
-        const std::lock_guard lock(mutex_);
-        latest_ = news;
-    }
-    void Closed(const ClosedFile& news) override { batch_.outlet_.Closed(news); }
-    void Warned(const Warning& news) override { batch_.outlet_.Warned(news); }
-    void LeftBehind(const NotCarried& news) override { batch_.outlet_.LeftBehind(news); }
-    void Ended(const Verdict& news) override {
-        Verdict verdict = news;
-        try {
-            if (verdict.outcome == Outcome::kDone)
-                journal_.NoteDone(movie_.output, source_, batch_.settings_);
-        } catch (const Failure& failure) {
-            verdict.outcome = Outcome::kFailed;
-            verdict.failure = failure;
-        }
-        {
-            const std::lock_guard lock(mutex_);
-            ending_ = std::move(verdict);
-        }
-        batch_.bell_.Ring();
+    void Closed(const ClosedFile& news) override { news_.Closed(news); }
+    void LeftBehind(const NotCarried& news) override { news_.LeftBehind(news); }
+    void Conclude(Verdict& verdict) override {
+        if (verdict.outcome == Outcome::kDone)
+            journal_.NoteDone(output_, source_, settings_);
     }
 
 private:
-    Batch& batch_;
+    Outlet& news_;
     BatchJournal& journal_;
-    const Movie movie_;
+    const std::string output_;
     const SourceMark source_;
-    mutable std::mutex mutex_;
-    Progress latest_;
-    std::optional<Verdict> ending_;
-    Job job_; // last: the others hear from it
+    const std::string& settings_;
 };
 
+} // namespace
+
 Batch::Batch(BatchOrder order, Observer& observer, Loop loop)
-    : order_(std::move(order)), outlet_(observer, std::move(loop)), clock_(WorkClock::Now()) {}
-
-Batch::~Batch() {
-    Stop();
-    if (thread_.joinable())
-        thread_.join();
-}
-
-void Batch::Start() {
-    thread_ = std::thread([this] { Run(); });
-}
-
-void Batch::Pause() {
-    pause_ = true;
-    bell_.Ring();
-}
-
-void Batch::Resume() {
-    pause_ = false;
-    bell_.Ring();
-}
-
-void Batch::Stop() {
-    stop_ = true;
-    bell_.Ring();
-}
-
-const Verdict* Batch::Result() const {
-    const std::lock_guard lock(mutex_);
-    return ended_ ? &verdict_ : nullptr;
-}
-
-void Batch::Run() noexcept {
-    // cppcheck-suppress throwInNoexceptFunction ; Attempt catches it
-    Verdict verdict = Attempt(*this, &Batch::Perform);
-    tasks_.clear();
-    {
-        const std::lock_guard lock(mutex_);
-        verdict_ = std::move(verdict);
-        ended_ = true;
-    }
-    try {
-        outlet_.Ended(verdict_);
-    } catch (const std::bad_alloc&) { // Result tells it
-    }
-}
+    : Crew(observer, std::move(loop)), order_(std::move(order)) {}
 
 Verdict Batch::Perform() {
     std::error_code error;
@@ -168,45 +90,30 @@ Verdict Batch::Perform() {
     if (error)
         throw Failure(Category::kOutput,
                       fmt::format("the folder \"{}\" cannot be made: {}", order_.folder, error.message()));
-    Json settings = SettingsAsJson(order_.request);
-    settings["maxSize"] = order_.request.maxSize.value_or(0);
-    settings["noVideo"] = order_.request.noVideo;
-    settings["detectCrop"] = order_.request.detectCrop;
+    Json settings = WishesAsJson(order_.request);
     settings["madeWith"] = CurrentVersions();
     settings_ = settings.dump(-1, ' ', false, Json::error_handler_t::replace);
-    BatchJournal journal(order_.folder);
-    if (journal.Damaged() > 0)
-        outlet_.Warned({Warning::Kind::kSource,
-                        fmt::format("{} lines of the journal in \"{}\" are damaged and not believed",
-                                    journal.Damaged(), order_.folder)});
-    const std::vector<Movie> movies = List();
-    std::deque<Movie> waiting(movies.begin(), movies.end());
-    count_ = static_cast<int>(movies.size());
-    outlet_.Started({fmt::format("{} movies", count_), order_.folder, 0, false});
+    journal_.emplace(order_.folder);
+    if (journal_->Damaged() > 0)
+        News().Warned({Warning::Kind::kSource,
+                       fmt::format("{} lines of the journal in \"{}\" are damaged and not believed",
+                                   journal_->Damaged(), order_.folder)});
+    List();
+    count_ = static_cast<int>(waiting_.size());
+    News().Started({fmt::format("{} movies", count_), order_.folder, 0, false});
     const auto processors = static_cast<int>(std::max(1U, std::thread::hardware_concurrency()));
-    const int jobs = order_.jobs > 0 ? order_.jobs : (processors + 1) / 2;
-    clock_.Skip(WorkClock::Now());
-    while (!tasks_.empty() || !waiting.empty()) {
-        const bool ends = stop_ || (worst_ && worst_->Kind() == Category::kNoSpace);
-        for (const auto& task : tasks_)
-            if (stop_)
-                task->Stop();
-        while (!ends && !waiting.empty() && static_cast<int>(tasks_.size()) < jobs) {
-            const Movie movie = waiting.front();
-            waiting.pop_front();
-            StartOne(movie, journal);
-        }
-        if (tasks_.empty() && (ends || waiting.empty()))
-            break;
-        bell_.Wait(paused_ ? std::nullopt : std::optional(WorkClock::kTick));
-        FollowWishes();
-        TakeEnded();
-        Report(waiting.size());
-    }
-    return Conclude(waiting.size());
+    WorkOff(order_.jobs > 0 ? order_.jobs : (processors + 1) / 2);
+    return Conclude();
 }
 
-std::vector<Batch::Movie> Batch::List() const {
+Crew::Mood Batch::HowToGoOn() const {
+    if (Stopped())
+        return Mood::kBreaksOff;
+    return worst_ && worst_->Kind() == Category::kNoSpace ? Mood::kBeginsNothing : Mood::kGoesOn;
+}
+
+/// Puts what is to be converted in its order.
+void Batch::List() {
     const std::string extension = ExtensionFor(order_.request);
     std::vector<Movie> movies;
     for (const std::string& input : order_.inputs) {
@@ -234,7 +141,7 @@ std::vector<Batch::Movie> Batch::List() const {
             throw Failure(Category::kRequest,
                           fmt::format("\"{}\" and \"{}\" would both become \"{}\"; choose other names",
                                       first->second, movie.input, movie.output));
-    return movies;
+    waiting_.assign(movies.begin(), movies.end());
 }
 
 std::string Batch::OutputFor(const std::string& input, const std::string& extension) const {
@@ -246,119 +153,93 @@ std::string Batch::OutputFor(const std::string& input, const std::string& extens
     return order_.folder + "/" + name;
 }
 
-/// Begins with a movie, unless it is converted already or cannot be.
-void Batch::StartOne(const Movie& movie, BatchJournal& journal) {
+std::optional<Crew::Assignment> Batch::Next() {
+    const Movie movie = waiting_.front();
+    waiting_.pop_front();
     try {
-        Request request = order_.request;
-        request.input = movie.input;
-        request.output = movie.output;
-        SourceMark source = MarkOf(movie.input);
-        if (!movie.named) {
-            try {
-                LookAtSource(request);
-            } catch (const Failure&) {
-                ++skipped_;
-                outlet_.Warned(
-                    {Warning::Kind::kSource, fmt::format("\"{}\" is left out: it is no movie", movie.input)});
-                return;
-            }
-        }
-        const BatchJournal::State state = journal.StateOf(movie.output, source, settings_);
-        if (state == BatchJournal::State::kDone) {
-            ++skipped_;
-            outlet_.Warned({Warning::Kind::kChosen,
-                            fmt::format("\"{}\" is there already, from the same source", movie.output)});
-            return;
-        }
-        request.overwrite = request.overwrite || state == BatchJournal::State::kBegun;
-        if (request.overwrite || access(movie.output.c_str(), F_OK) != 0) // else it will be refused
-            journal.NoteBegun(movie.output, source, settings_);
-        auto task = std::make_unique<Task>(*this, journal, movie, std::move(source), std::move(request));
-        task->Conversion().Start();
-        tasks_.push_back(std::move(task));
+        return Assign(movie);
     } catch (const Failure& failure) {
-        Fail(movie, failure);
+        Fail(movie.input, failure);
+        return std::nullopt;
     }
 }
 
-void Batch::TakeEnded() {
-    for (auto task = tasks_.begin(); task != tasks_.end();) {
-        const std::optional<Verdict> ending = (*task)->Ending();
-        if (!ending) {
-            ++task;
-            continue;
-        }
-        converted_ += ending->position;
-        bytes_ += ending->bytes;
-        if (ending->outcome == Outcome::kDone)
-            ++done_;
-        else if (ending->failure)
-            Fail((*task)->What(), *ending->failure);
-        task = tasks_.erase(task);
+/// Nothing when it is converted already, or no movie.
+std::optional<Crew::Assignment> Batch::Assign(const Movie& movie) {
+    Request request = order_.request;
+    request.input = movie.input;
+    request.output = movie.output;
+    SourceMark source = MarkOf(movie.input);
+    if (!movie.named && !IsMovie(request)) {
+        ++skipped_;
+        return std::nullopt;
+    }
+    const BatchJournal::State state = journal_->StateOf(movie.output, source, settings_);
+    if (state == BatchJournal::State::kDone) {
+        ++skipped_;
+        News().Warned({Warning::Kind::kChosen,
+                       fmt::format("\"{}\" is there already, from the same source", movie.output)});
+        return std::nullopt;
+    }
+    request.overwrite = request.overwrite || state == BatchJournal::State::kBegun;
+    if (request.overwrite || access(movie.output.c_str(), F_OK) != 0) // else it will be refused
+        journal_->NoteBegun(movie.output, source, settings_);
+    return Assignment{request, std::make_unique<MovieErrand>(News(), *journal_, movie.output,
+                                                             std::move(source), settings_)};
+}
+
+/// Of a file that was found in a folder; tells why not.
+bool Batch::IsMovie(const Request& request) {
+    try {
+        LookAtSource(request);
+        return true;
+    } catch (const Failure& failure) {
+        News().Warned(
+            {Warning::Kind::kSource, fmt::format("\"{}\" is left out: {}", request.input, failure.Text())});
+        return false;
     }
 }
 
-void Batch::Fail(const Movie& movie, const Failure& failure) {
+void Batch::Take(const std::string& input, const Verdict& ending) {
+    converted_ += ending.position;
+    bytes_ += ending.bytes;
+    if (ending.outcome == Outcome::kDone)
+        ++done_;
+    else if (ending.failure)
+        Fail(input, *ending.failure);
+}
+
+void Batch::Fail(const std::string& input, const Failure& failure) {
     ++failed_;
-    outlet_.Warned({Warning::Kind::kFailed, fmt::format("\"{}\": {}", movie.input, failure.Text())});
+    News().Warned({Warning::Kind::kFailed, fmt::format("\"{}\": {}", input, failure.Text())});
     if (!worst_ || Badness(failure.Kind()) > Badness(worst_->Kind()))
         worst_ = failure;
 }
 
-void Batch::FollowWishes() {
-    if (pause_ != paused_ && !stop_) {
-        paused_ = pause_;
-        for (const auto& task : tasks_) {
-            if (paused_)
-                task->Conversion().Pause();
-            else
-                task->Conversion().Resume();
-        }
-    }
-    paused_ = paused_ && !stop_;
-    if (paused_)
-        clock_.Stand(WorkClock::Now());
-    else
-        clock_.Go(WorkClock::Now());
-}
-
 /// The lengths of movies that wait are taken to be those of the others on average.
-void Batch::Report(std::size_t waiting) {
-    Progress report;
-    report.position = converted_;
-    report.bytes = bytes_;
-    report.length = converted_;
-    for (const auto& task : tasks_) {
-        const Progress latest = task->Latest();
-        report.position += latest.position;
-        report.length += std::max(latest.length, latest.position);
-        report.bytes += latest.bytes;
-    }
-    const auto known = done_ + static_cast<int>(tasks_.size());
+void Batch::Report() {
+    Progress report = UnderWay();
+    report.position += converted_;
+    report.length += converted_;
+    report.bytes += bytes_;
+    const std::size_t known = static_cast<std::size_t>(done_) + Busy();
     if (known > 0)
-        report.length += report.length / known * static_cast<double>(waiting);
-    report.phase = paused_ ? Phase::kPaused : Phase::kConverting;
-    report.worked = clock_.Seconds();
-    speed_.Add(report.worked, report.position);
-    report.speed = speed_.Speed();
-    report.left = speed_.Left(report.length);
-    if (report.length > 0)
-        report.percent = std::min(report.position / report.length * 100, kMostPercent);
-    outlet_.Progressed(report);
+        report.length += report.length / static_cast<double>(known) * static_cast<double>(waiting_.size());
+    Tell(report);
 }
 
-Verdict Batch::Conclude(std::size_t waiting) {
+Verdict Batch::Conclude() {
     Verdict verdict;
     verdict.position = converted_;
     verdict.bytes = bytes_;
     verdict.files = done_;
-    verdict.worked = clock_.Seconds();
-    verdict.outcome = failed_ > 0 ? Outcome::kFailed : stop_ ? Outcome::kStopped : Outcome::kDone;
+    verdict.worked = Worked();
+    verdict.outcome = failed_ > 0 ? Outcome::kFailed : Stopped() ? Outcome::kStopped : Outcome::kDone;
     if (failed_ > 0) {
         verdict.failure =
             Failure(worst_->Kind(), fmt::format("{} of {} movies failed; {} converted, {} left as "
                                                 "they are, {} not begun",
-                                                failed_, count_, done_, skipped_, waiting));
+                                                failed_, count_, done_, skipped_, waiting_.size()));
     }
     return verdict;
 }

@@ -2,21 +2,12 @@
 #ifndef MOVIECONV_HOST_PIECES_BATCH_H
 #define MOVIECONV_HOST_PIECES_BATCH_H
 
-#include "host/convert/Bell.h"
-#include "host/convert/Job.h"
-#include "host/convert/Outlet.h"
-#include "host/convert/SpeedMeter.h"
-#include "host/convert/Work.h"
-#include "host/convert/WorkClock.h"
 #include "host/pieces/BatchJournal.h"
+#include "host/pieces/Crew.h"
 
-#include <atomic>
 #include <deque>
-#include <memory>
-#include <mutex>
 #include <optional>
 #include <string>
-#include <thread>
 #include <vector>
 
 namespace movieconv {
@@ -30,53 +21,38 @@ struct BatchOrder {
 };
 
 /// Converts what is not converted already, by the folder's journal. The verdict's failure is the worst.
-class Batch final : public Work {
+class Batch final : public Crew {
 public:
     Batch(BatchOrder order, Observer& observer, Loop loop);
-    ~Batch() override;
-
-    void Start() override;
-    void Pause() override;
-    void Resume() override;
-    void Stop() override;
-    const Verdict* Result() const override;
+    ~Batch() override { Finish(); }
 
 private:
-    class Task;
     struct Movie {
         std::string input;
         std::string output;
         bool named; ///< By the user, not found in a folder.
     };
 
-    void Run() noexcept;
-    Verdict Perform();
-    std::vector<Movie> List() const;
+    Verdict Perform() override;
+    Mood HowToGoOn() const override;
+    bool HasMore() const override { return !waiting_.empty(); }
+    std::optional<Assignment> Next() override;
+    void Take(const std::string& input, const Verdict& ending) override;
+    void Report() override;
+
+    void List();
     std::string OutputFor(const std::string& input, const std::string& extension) const;
-    void StartOne(const Movie& movie, BatchJournal& journal);
-    void TakeEnded();
-    void Fail(const Movie& movie, const Failure& failure);
-    void FollowWishes();
-    void Report(std::size_t waiting);
-    Verdict Conclude(std::size_t waiting);
+    std::optional<Assignment> Assign(const Movie& movie);
+    bool IsMovie(const Request& request);
+    void Fail(const std::string& input, const Failure& failure);
+    Verdict Conclude();
 
     const BatchOrder order_;
-    Outlet outlet_;
-    std::thread thread_;
-    std::atomic<bool> stop_{false};
-    std::atomic<bool> pause_{false};
-    Bell bell_;
-
-    mutable std::mutex mutex_; // guards these two
-    bool ended_ = false;
-    Verdict verdict_;
+    std::optional<BatchJournal> journal_;
+    std::string settings_;
 
     // The batch's own thread's.
-    std::string settings_;
-    std::vector<std::unique_ptr<Task>> tasks_;
-    WorkClock clock_;
-    SpeedMeter speed_;
-    bool paused_ = false;
+    std::deque<Movie> waiting_;
     double converted_ = 0; // seconds, of movies that are done
     int64_t bytes_ = 0;
     int count_ = 0;

@@ -2,23 +2,12 @@
 #ifndef MOVIECONV_HOST_PIECES_FOREMAN_H
 #define MOVIECONV_HOST_PIECES_FOREMAN_H
 
-#include "host/convert/Bell.h"
-#include "host/convert/Job.h"
-#include "host/convert/Outlet.h"
-#include "host/convert/SpeedMeter.h"
-#include "host/convert/Work.h"
-#include "host/convert/WorkClock.h"
+#include "host/pieces/Crew.h"
 #include "host/pieces/Plan.h"
 
-#include <atomic>
-#include <condition_variable>
 #include <deque>
-#include <memory>
-#include <mutex>
 #include <optional>
 #include <string>
-#include <thread>
-#include <vector>
 
 namespace movieconv {
 
@@ -39,62 +28,39 @@ struct PieceOrder {
 /// The plan that a conversion in pieces keeps beside its output.
 std::string PlanPathFor(const std::string& output);
 
-class Foreman final : public Work {
+class Foreman final : public Crew {
 public:
     /// `observer` hears of all pieces together as of one conversion, by means of `loop`.
     Foreman(PieceOrder order, Observer& observer, Loop loop);
-    ~Foreman() override;
-
-    void Start() override;
-    void Pause() override;
-    void Resume() override;
-    void Stop() override;
-    const Verdict* Result() const override;
-
-    /// Waits until it has ended. The last news may still wait in the loop.
-    void Wait();
+    ~Foreman() override { Finish(); }
 
 private:
-    class Task;
+    Verdict Perform() override;
+    Mood HowToGoOn() const override;
+    bool HasMore() const override { return !missing_.empty(); }
+    std::optional<Assignment> Next() override;
+    void Take(const std::string& input, const Verdict& ending) override;
+    void Report() override;
 
-    void Run() noexcept;
-    Verdict Perform();
     std::optional<Plan> Prepare();
     std::optional<Plan> Leftover(const Plan& now);
-    std::deque<int> Missing(const Plan& plan) const;
-    void Announce(const Plan& plan, const std::deque<int>& missing);
-    int JobsFor(const Plan& plan);
-    Verdict MakeAll(const Plan& plan, std::deque<int> missing);
-    void StartTask(const Plan& plan, int number);
-    void TakeEnded(Verdict& verdict);
-    void FollowWishes();
-    Verdict JoinAll(const Plan& plan);
-    Progress Figures();
-    void Report(Phase phase, double finished = 0);
-    void ForAll(void (Job::*tell)());
+    std::deque<int> FindMissing() const;
+    void Announce();
+    int JobsFor();
+    void ReportFinishing(double share);
+    void JoinAll();
 
     const PieceOrder order_;
-    Outlet outlet_;
-    std::thread thread_;
-    std::atomic<bool> stop_{false};
-    std::atomic<bool> pause_{false};
 
-    Bell bell_; // there is something new
-
-    mutable std::mutex mutex_;                 // guards what follows
-    std::vector<std::unique_ptr<Task>> tasks_; // only the foreman's thread changes the list
-    std::condition_variable end_;
-    bool ended_ = false;
-    Verdict verdict_;
+    // The foreman's thread's, and read by the pieces' threads while pieces are made.
+    Plan plan_;
 
     // The foreman's thread's.
-    WorkClock clock_;
-    SpeedMeter speed_;
+    std::deque<int> missing_; // pieces that are to be begun
+    Verdict verdict_;
     double length_ = 0; // seconds of all pictures to be converted
     double done_ = 0;   // of the pieces that are made
     int64_t bytes_ = 0;
-    bool paused_ = false;
-    Phase told_ = Phase::kConverting;
 };
 
 } // namespace movieconv

@@ -49,6 +49,8 @@ struct Plan {
     Request settings;   ///< Without input, output and piece.
     Division division;
     bool fromStart = false; ///< See PieceCut.
+    bool hasRates = false;  ///< The pictures have a bit rate, which begins anew in every piece.
+    int64_t memory = 0;     ///< Bytes that making a piece takes at most.
     std::vector<Piece>
         pictures;     ///< Behind them comes one more piece, the sound and whatever else is carried.
     std::string hash; ///< Of all the above; set by what reads and writes plans.

@@ -28,14 +28,6 @@ Json AsJson(const Piece& piece) {
     return json;
 }
 
-Json AsJson(const SourceMark& source) {
-    return {{"path", source.path},
-            {"bytes", source.bytes},
-            {"modified", source.modified},
-            {"headSha256", source.head},
-            {"tailSha256", source.tail}};
-}
-
 Json AsJson(const Division& division) {
     Json json = Json::object();
     if (division.pieces)
@@ -50,11 +42,13 @@ Json AsJson(const Plan& plan) {
     Json json;
     json["version"] = kVersion;
     json["madeWith"] = plan.versions;
-    json["source"] = AsJson(plan.source);
+    json["source"] = MarkAsJson(plan.source);
     json["output"] = plan.output;
     json["settings"] = SettingsAsJson(plan.settings);
     json["division"] = AsJson(plan.division);
     json["readFromStart"] = plan.fromStart;
+    json["hasRates"] = plan.hasRates;
+    json["memoryPerPiece"] = plan.memory;
     json["ticksPerSecond"] = kTicksPerSecond;
     Json pieces = Json::array();
     int64_t pictures = 0;
@@ -151,6 +145,8 @@ Plan PlanFrom(const Json& json) {
     plan.output = Path(json.at("output"));
     plan.settings = SettingsFromJson(json.at("settings"));
     plan.fromStart = json.at("readFromStart").get<bool>();
+    plan.hasRates = json.at("hasRates").get<bool>();
+    plan.memory = Natural(json, "memoryPerPiece");
     const Json& division = json.at("division");
     if (division.contains("pieces"))
         plan.division.pieces = division.at("pieces").get<int>();
@@ -189,20 +185,8 @@ void WritePlan(const std::string& path, Plan& plan) {
 }
 
 std::string Difference(const Plan& before, const Plan& now) {
-    const Json one = AsJson(before);
-    const Json other = AsJson(now);
-    const auto text = [](const Json& json, const std::string& key) {
-        return json.contains(key) ? json.at(key).dump() : std::string("nothing");
-    };
-    std::string what;
-    for (const char* part : {"madeWith", "source", "settings", "division"}) {
-        Json keys = one.at(part);
-        keys.update(other.at(part));
-        for (const auto& [key, value] : keys.items())
-            if (text(one.at(part), key) != text(other.at(part), key))
-                what += fmt::format("{}{} {} was {}, now {}", what.empty() ? "" : "; ", part, key,
-                                    text(one.at(part), key), text(other.at(part), key));
-    }
+    std::string what =
+        DifferenceIn(AsJson(before), AsJson(now), {"madeWith", "source", "settings", "division"});
     if (before.output != now.output)
         what += fmt::format("{}the output was \"{}\"", what.empty() ? "" : "; ", before.output);
     return what;

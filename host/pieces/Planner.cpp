@@ -157,6 +157,14 @@ std::vector<std::optional<int64_t>> TicksBefore(const EncodeParam& param, Movie&
     return before;
 }
 
+/// What making one piece takes at most: pictures waiting for each other, and the encoder's view of its
+/// future.
+int64_t MemoryPerPiece(const PictureStreamInfo& pictures) {
+    constexpr int64_t kFixed = 40 << 20;
+    constexpr int64_t kPicturesHeld = 70;
+    return kFixed + kPicturesHeld * pictures.width * pictures.height * 3 / 2;
+}
+
 /// Pictures behind its end that the encoder of a piece looks at.
 std::size_t PicturesAhead(const EncodeParam& param, const Request& request, const SourceInfo& source) {
     const PicturePlan plan = PlanPictures(request, ChooseFormat(request), *source.pictures);
@@ -213,6 +221,8 @@ std::optional<Plan> MakePlan(const Request& request, const Division& division, b
         throw Failure(Category::kSource,
                       fmt::format("\"{}\" was written to while it was read", plan.source.path));
     plan.fromStart = stamps->clockJumps;
+    plan.hasRates = HasRates(pictures, ChooseFormat(pictures), movie.Info());
+    plan.memory = MemoryPerPiece(*movie.Info().pictures);
     const std::vector<std::size_t> firsts = FirstPictures(*stamps, division);
     if (firsts.size() > std::size_t{kMostPieces})
         throw Failure(Category::kRequest, fmt::format("that makes {} pieces; at most {} can be made",
@@ -238,10 +248,7 @@ std::optional<Plan> MakePlan(const Request& request, const Division& division, b
 }
 
 std::string TellBitRate(const Plan& plan) {
-    Request request = plan.settings;
-    request.input = plan.source.path;
-    request.output = plan.output;
-    if (!HasRates(request, ChooseFormat(request), LookAtSource(request)))
+    if (!plan.hasRates)
         return {};
     const double seconds = ToSeconds(plan.pictures.back().end - plan.pictures.front().begin) /
                            static_cast<double>(plan.pictures.size());

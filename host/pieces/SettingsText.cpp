@@ -3,6 +3,7 @@
 #include "host/convert/Formats.h"
 
 #include <cmath>
+#include <fmt/format.h>
 #include <limits>
 #include <map>
 #include <set>
@@ -240,6 +241,38 @@ Json SettingsAsJson(const Request& request) {
     Preferred(preferred, request.preferences);
     json["preferences"] = std::move(preferences);
     return json;
+}
+
+Json WishesAsJson(const Request& request) {
+    Json json = SettingsAsJson(request);
+    json["maxSize"] = request.maxSize.value_or(0);
+    json["noVideo"] = request.noVideo;
+    json["detectCrop"] = request.detectCrop;
+    return json;
+}
+
+Json MarkAsJson(const SourceMark& source) {
+    return {{"path", source.path},
+            {"bytes", source.bytes},
+            {"modified", source.modified},
+            {"headSha256", source.head},
+            {"tailSha256", source.tail}};
+}
+
+std::string DifferenceIn(const Json& before, const Json& now, const std::vector<std::string>& parts) {
+    const auto text = [](const Json& json, const std::string& key) {
+        return json.contains(key) ? json.at(key).dump() : std::string("nothing");
+    };
+    std::string what;
+    for (const std::string& part : parts) {
+        Json keys = before.at(part);
+        keys.update(now.at(part));
+        for (const auto& [key, value] : keys.items())
+            if (text(before.at(part), key) != text(now.at(part), key))
+                what += fmt::format("{}{} {} was {}, now {}", what.empty() ? "" : "; ", part, key,
+                                    text(before.at(part), key), text(now.at(part), key));
+    }
+    return what;
 }
 
 Request SettingsFromJson(const Json& json) {

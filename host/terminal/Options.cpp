@@ -424,8 +424,8 @@ void RequirePieces(const Options& options) {
     if (options.jobs && options.task != Task::kConvert)
         throw Failure(Category::kRequest,
                       "--jobs goes with a conversion, not with --plan, --piece or --join");
-    if (options.resume && !options.jobs)
-        throw Failure(Category::kRequest, "--resume goes with --jobs");
+    if (options.resume && !options.jobs && !options.request.split)
+        throw Failure(Category::kRequest, "--resume goes with --jobs or --split");
     if (options.jobs && options.preview)
         throw Failure(Category::kRequest, "--jobs converts many places at once and so excludes --preview");
 }

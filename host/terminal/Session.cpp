@@ -2,6 +2,7 @@
 
 #include "host/convert/Job.h"
 #include "host/pieces/Batch.h"
+#include "host/pieces/ClipRun.h"
 #include "host/pieces/Foreman.h"
 
 #include <chrono>
@@ -13,6 +14,12 @@ namespace movieconv {
 namespace {
 
 constexpr std::chrono::milliseconds kTick{500};
+
+std::unique_ptr<Work> MakeConversion(const Options& options, Observer& observer, Loop loop) {
+    if (options.request.split)
+        return std::make_unique<ClipRun>(options.request, options.resume, observer, std::move(loop));
+    return std::make_unique<Job>(options.request, observer, std::move(loop));
+}
 
 /// What the options ask for: one conversion, or pieces of it.
 std::unique_ptr<Work> MakeWork(const Options& options, Observer& observer, Loop loop) {
@@ -32,7 +39,7 @@ std::unique_ptr<Work> MakeWork(const Options& options, Observer& observer, Loop 
         return std::make_unique<Batch>(std::move(order), observer, std::move(loop));
     }
     if (options.task == Task::kConvert && !options.jobs)
-        return std::make_unique<Job>(options.request, observer, std::move(loop));
+        return MakeConversion(options, observer, std::move(loop));
     PieceOrder order;
     order.keepPieces = options.keepPieces;
     order.onFull = options.request.onFull;

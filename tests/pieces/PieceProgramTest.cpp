@@ -2,6 +2,7 @@
 #include "tests/pieces/Packets.h"
 #include "tests/support/Folder.h"
 #include "tests/support/Program.h"
+#include "tests/support/SmallDisk.h"
 #include "tests/support/TestMovies.h"
 
 #include <gtest/gtest.h>
@@ -25,6 +26,7 @@ using test_movies::Args;
 constexpr int kUsage = 2;
 constexpr int kCannotRead = 3;
 constexpr int kCannotWrite = 4;
+constexpr int kNoSpace = 5;
 constexpr int kStopped = 6;
 
 /// Eight seconds, plain but for sound that ends early.
@@ -150,6 +152,10 @@ TEST(Pieces, TellWhenThePlanOrTheSourceWasChanged) {
     refuses(with("\"output\": \"", "\"output\": \"/tmp/.."), "absolute path");
     refuses(with("\"path\": \"/", "\"path\": \""), "absolute path");
     refuses(with("\"version\": 1", "\"version\": 2"), "version 2");
+    std::string tooMany;
+    for (int piece = 0; piece < 10001; ++piece)
+        tooMany += R"({"kind":"rest"},)";
+    refuses(with("\"pieces\": [", "\"pieces\": [" + tooMany), "not a list of 2 to 10001");
     refuses("{}", "not a plan");
     WriteFile(farm.plan, plan);
     for (const char* number : {"5", "-1", "99999999999"})
@@ -193,6 +199,41 @@ TEST(Pieces, EndOnASignalWithCodeSixAndLeaveNothing) {
     const Result result = piece.Finish();
     EXPECT_EQ(result.code, kStopped) << result.out << result.err;
     EXPECT_EQ(folder.Names(), (std::vector<std::string>{"movie.plan"}));
+}
+
+/// Two machines that make the same piece at once.
+TEST(Pieces, MayBeMadeTwiceAtOnce) {
+    const Folder folder;
+    const std::string plan = folder / "movie.plan";
+    ASSERT_EQ(Call({"-q", "--plan", plan, "--pieces", "1", LongSource(), folder / "out.mp4"}).code, 0);
+    const Args make{"--progress", "json", "--piece", "0", plan};
+    Running one(make, false);
+    Running other(make, false);
+    ASSERT_TRUE(one.WaitFor(R"("event":"progress")"));
+    ASSERT_TRUE(other.WaitFor(R"("event":"progress")"));
+    const Result first = one.Finish();
+    const Result second = other.Finish();
+    EXPECT_EQ(first.code, 0) << first.err;
+    EXPECT_EQ(second.code, 0) << second.err;
+    EXPECT_EQ(folder.Names(), (std::vector<std::string>{"movie.plan", "movie.plan.0000.piece"}));
+    EXPECT_EQ(Call({"-q", "--piece", "1", plan}).code, 0);
+    EXPECT_EQ(Call({"-q", "--join", plan}).code, 0);
+}
+
+TEST(Pieces, ThatFindNoRoomLeaveNothingAndAreMadeLater) {
+    const Folder folder;
+    const SmallDisk disk(folder / "disk", "400k");
+    if (!disk.IsThere())
+        GTEST_SKIP() << "no file system can be mounted here";
+    const std::string plan = folder / "disk/movie.plan";
+    ASSERT_EQ(Call({"-q", "--plan", plan, "--pieces", "2", LongSource(), folder / "out.mp4"}).code, 0);
+    const Result full = Call({"-q", "--piece", "0", plan});
+    EXPECT_EQ(full.code, kNoSpace) << full.err;
+    EXPECT_EQ(folder.Names("disk"), (std::vector<std::string>{"movie.plan"}));
+    ASSERT_TRUE(disk.Grow());
+    for (const char* number : {"0", "1", "2"})
+        EXPECT_EQ(Call({"-q", "--piece", number, plan}).code, 0);
+    EXPECT_EQ(Call({"-q", "--join", plan}).code, 0);
 }
 
 /// Killed at any moment, however often, the same command with --resume ends with the bytes of an undisturbed

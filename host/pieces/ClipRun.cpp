@@ -1,0 +1,103 @@
+#include "host/pieces/ClipRun.h"
+
+#include "host/convert/Failure.h"
+#include "host/convert/OutputCheck.h"
+
+#include <fmt/format.h>
+#include <utility>
+
+namespace movieconv {
+
+ClipRun::ClipRun(Request request, bool resume, Observer& observer, Loop loop)
+    : request_(std::move(request)), resume_(resume), outlet_(observer, std::move(loop)), journal_(request_) {
+    Prepare();
+    job_.emplace(request_, static_cast<Observer&>(*this));
+}
+
+void ClipRun::Prepare() {
+    keeps_ = journal_.IsPossible();
+    if (resume_ && !keeps_)
+        throw Failure(Category::kRequest,
+                      fmt::format("\"{}\" is a playlist, a pipe or a device: whether it is still the same "
+                                  "cannot be told, so clips of it cannot be gone on with",
+                                  request_.input));
+    if (resume_)
+        request_.firstClip = journal_.Leftover();
+    worth_ = request_.firstClip.has_value();
+    // Clips from there on are of the same conversion, which would have replaced no others.
+    request_.overwrite = request_.overwrite || worth_;
+    isLeft_ = !worth_ && journal_.Exists();
+    try {
+        CheckOutput(request_);
+    } catch (const Failure& failure) {
+        if (!isLeft_ || failure.Why() != Reason::kExists)
+            throw;
+        throw Failure(
+            failure.Kind(),
+            fmt::format("{}, of an earlier run of which \"{}\" tells", failure.Text(), journal_.Path()),
+            failure.Why());
+    }
+}
+
+void ClipRun::Start() {
+    job_->Start();
+}
+
+void ClipRun::Pause() {
+    job_->Pause();
+}
+
+void ClipRun::Resume() {
+    job_->Resume();
+}
+
+void ClipRun::Stop() {
+    job_->Stop();
+}
+
+const Verdict* ClipRun::Result() const {
+    return job_->Result();
+}
+
+void ClipRun::Started(const struct Start& news) {
+    outlet_.Started(news);
+    if (request_.firstClip)
+        outlet_.Warned(
+            {Warning::Kind::kChosen, fmt::format("{} clips are made already", request_.firstClip->number)});
+    if (isLeft_)
+        outlet_.Warned(
+            {Warning::Kind::kLeftover,
+             fmt::format("\"{}\" is left of an earlier run; its clips are made anew", journal_.Path())});
+}
+
+/// When a clip is opened, the one before it is finished and under its name.
+void ClipRun::Opened(const OpenedFile& news) {
+    try {
+        if (keeps_ && !begun_) {
+            journal_.Begin();
+            begun_ = true;
+        } else if (keeps_) {
+            journal_.NoteFinished(closed_, {news.number - 1, news.begin});
+            worth_ = true;
+        }
+    } catch (const Failure& failure) {
+        keeps_ = false;
+        outlet_.Warned(
+            {Warning::Kind::kSource,
+             fmt::format("{}; should the conversion break off, it cannot be gone on with", failure.Text())});
+    }
+    outlet_.Opened(news);
+}
+
+void ClipRun::Closed(const ClosedFile& news) {
+    closed_ = news.path;
+    outlet_.Closed(news);
+}
+
+void ClipRun::Ended(const Verdict& news) {
+    if (begun_ && (news.outcome == Outcome::kDone || !worth_))
+        journal_.Remove();
+    outlet_.Ended(news);
+}
+
+} // namespace movieconv

@@ -1,0 +1,142 @@
+// The program's conversions into clips that break off, and the same command with --resume.
+#include "tests/pieces/Packets.h"
+#include "tests/support/Folder.h"
+#include "tests/support/Program.h"
+#include "tests/support/TestMovies.h"
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <csignal>
+#include <filesystem>
+#include <fmt/format.h>
+#include <string>
+#include <sys/stat.h>
+#include <vector>
+
+namespace {
+
+using program::Call;
+using program::Result;
+using program::Running;
+using test_movies::Args;
+using test_movies::Join;
+
+constexpr int kUsage = 2;
+constexpr int kCannotWrite = 4;
+
+bool Has(const std::string& text, const std::string& part) {
+    return text.find(part) != std::string::npos;
+}
+
+/// Ten clips of two seconds, with pictures that build on later ones and sound that ends early.
+std::string ClipSource() {
+    return test_movies::Make("clips-left.mp4", {"-f", "lavfi", "-i", "testsrc2=s=320x240:r=25:d=20", "-f",
+                                                "lavfi", "-i", "sine=d=19.5", "-c:v", "libx264", "-preset",
+                                                "ultrafast", "-g", "70", "-bf", "2", "-c:a", "aac"});
+}
+
+/// A conversion of it that was killed when it had finished two clips or more.
+struct Killed {
+    Folder folder;
+    std::string output = folder / "out.mp4";
+    std::string list = output + ".clips";
+    Args options{"--progress", "json", "--split", "2"};
+
+    Killed() {
+        while (!std::filesystem::exists(list)) { // it can have come to its end before the signal
+            Running run(Join(options, Args{"-y", ClipSource(), output}), false);
+            EXPECT_TRUE(run.WaitFor(R"("event":"clip_opened".*_02\.mp4)"));
+            run.Signal(SIGKILL);
+            run.Finish();
+        }
+    }
+    int Listed() const {
+        const std::string lines = ReadFile(list);
+        return static_cast<int>(std::count(lines.begin(), lines.end(), '\n')) - 1;
+    }
+    /// What is there but for the clip that the kill left unfinished, which stays as after any kill.
+    std::vector<std::string> Names() const {
+        std::vector<std::string> names = folder.Names();
+        std::erase_if(names, [](const std::string& name) { return name.ends_with(".part"); });
+        return names;
+    }
+    Result Resume(const Args& more = {}) const {
+        return Call(Join(options, Args{"--resume"}, more, Args{ClipSource(), output}));
+    }
+    std::string Clip(int number) const { return folder / fmt::format("out_{:02}.mp4", number); }
+};
+
+/// All packets with their times; what decoded sound holds depends on where decoding began.
+std::vector<std::string> Times(const std::string& path) {
+    std::vector<std::string> lines = packets::Of(path);
+    for (std::string& line : lines)
+        line.resize(std::min(line.find(" holds "), line.size()));
+    return lines;
+}
+
+std::string Told(int clips) {
+    return fmt::format("{} clips are made already", clips);
+}
+
+TEST(ClipsLeft, AreGoneOnWithAtTheFirstOneMissing) {
+    const Folder calm;
+    ASSERT_EQ(Call({"-q", "--split", "2", ClipSource(), calm / "out.mp4"}).code, 0);
+    EXPECT_EQ(calm.Names().size(), 10U);
+    const Killed killed;
+    const auto before = std::filesystem::last_write_time(killed.Clip(1));
+    const std::string told = Told(killed.Listed());
+    const Result resumed = killed.Resume();
+    ASSERT_EQ(resumed.code, 0) << resumed.err;
+    EXPECT_TRUE(Has(resumed.out + resumed.err, told)) << resumed.out << resumed.err;
+    EXPECT_EQ(killed.Names(), calm.Names()) << "all clips, and nothing that lists them";
+    EXPECT_EQ(std::filesystem::last_write_time(killed.Clip(1)), before);
+    for (const std::string& name : calm.Names())
+        EXPECT_EQ(Times(killed.folder / name), Times(calm / name)) << name;
+}
+
+TEST(ClipsLeft, AreNotUsedForAnotherConversionOrWithoutBeingAskedFor) {
+    const Killed killed;
+    const Result other = killed.Resume({"--size", "80x60"});
+    EXPECT_EQ(other.code, kUsage);
+    EXPECT_TRUE(Has(other.err, "settings size was nothing, now [80,60]")) << other.err;
+    const Args anew = Join(killed.options, Args{ClipSource(), killed.output});
+    const Result refused = Call(anew);
+    EXPECT_EQ(refused.code, kCannotWrite);
+    EXPECT_TRUE(Has(refused.err, "out.mp4.clips")) << refused.err;
+    WriteFile(killed.Clip(0), "precious");
+    const Result changed = killed.Resume();
+    EXPECT_EQ(changed.code, kCannotWrite);
+    EXPECT_TRUE(Has(changed.err, "was changed since it was finished")) << changed.err;
+    EXPECT_EQ(ReadFile(killed.Clip(0)), "precious");
+    const Result replaced = Call(Join(Args{"-y"}, anew));
+    EXPECT_EQ(replaced.code, 0);
+    EXPECT_TRUE(Has(replaced.out + replaced.err, "its clips are made anew")) << replaced.out << replaced.err;
+    EXPECT_EQ(killed.Names().size(), 10U);
+}
+
+TEST(ClipsLeft, ThatAreMissingOrListedOnADamagedLineAreMadeAgain) {
+    for (const bool missing : {true, false}) {
+        const Killed killed;
+        const std::string told = Told(missing ? 1 : killed.Listed() - 1);
+        if (missing)
+            std::filesystem::remove(killed.Clip(1));
+        else
+            std::filesystem::resize_file(killed.list, std::filesystem::file_size(killed.list) - 20);
+        const Result resumed = killed.Resume();
+        ASSERT_EQ(resumed.code, 0) << resumed.err;
+        EXPECT_TRUE(Has(resumed.out + resumed.err, told)) << resumed.out << resumed.err;
+        EXPECT_EQ(killed.Names().size(), 10U);
+    }
+}
+
+TEST(ClipsLeft, OfAPipeAreNot) {
+    const Folder folder;
+    const std::string pipe = folder / "pipe.mkv";
+    ASSERT_EQ(mkfifo(pipe.c_str(), 0600), 0);
+    const Result result = Call({"--split", "2", "--resume", pipe, folder / "out.mp4"});
+    EXPECT_EQ(result.code, kUsage) << result.err;
+    EXPECT_EQ(Call({"--resume", ClipSource(), folder / "out.mp4"}).code, kUsage);
+}
+
+} // namespace
