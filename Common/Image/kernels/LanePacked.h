@@ -120,7 +120,8 @@ struct LanePacked {
     [[gnu::flatten]] static void PackedFromBgr24(Rows packed, Rows rgb, Size size) {
         ForRowBlocks<2, 3>(
             packed, rgb, size, [](const RowKernels& k) { return k.packedFromBgr24[kOrder]; },
-            [](uint8_t* to, const uint8_t* from) {
+            [step = rgb.step](uint8_t* to, const uint8_t* from) {
+                PrefetchRow(from + step, 3 * kPixels);
                 const auto pixels = From::Bgr24::Pixels(From::Bgr24::Load(from));
                 StorePacked<kOrder>(
                     to, From::template Luma<FastRgbForm>(pixels),
