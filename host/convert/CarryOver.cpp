@@ -212,6 +212,34 @@ int CarryChapters(const SourceInfo& source, uint32_t set) {
     return left;
 }
 
+/// Where chapters are texts about the movie: CHAPTER001, CHAPTER001NAME ...
+bool HoldsChapterTexts(const FileFormatInfo& format) {
+    return format.fccFormat == FourCC("OGG ");
+}
+
+/// CarryChapters as texts, of what lies in the one file that the request asks for.
+int CarryChapterTexts(const SourceInfo& source, const Request& request, uint32_t set) {
+    constexpr int kMost = 999;
+    int number = 0;
+    int left = 0;
+    for (const Chapter& chapter : source.chapters) {
+        const double begin = std::max(chapter.begin - request.begin, 0.0);
+        const bool isThere = chapter.end > request.begin && (!request.length || begin < *request.length);
+        if (chapter.end <= chapter.begin || (isThere && number == kMost)) {
+            ++left;
+        } else if (isThere) {
+            const auto milliseconds = std::llround(begin * 1000);
+            const std::string key = fmt::format("CHAPTER{:03}", ++number);
+            MWSetTag(set, key.c_str(),
+                     fmt::format("{:02}:{:02}:{:02}.{:03}", milliseconds / 3'600'000,
+                                 milliseconds / 60'000 % 60, milliseconds / 1000 % 60, milliseconds % 1000)
+                         .c_str());
+            MWSetTag(set, (key + "NAME").c_str(), chapter.title.c_str());
+        }
+    }
+    return left;
+}
+
 bool CarryFile(const Movie& movie, const StreamInfo& stream, uint32_t set) {
     const std::vector<uint8_t> data = movie.StoredFile(stream.index);
     const auto size = static_cast<int64_t>(data.size());
@@ -274,7 +302,8 @@ std::string CarryStored(const Movie& movie, const StreamInfo& stream, uint32_t s
 
 std::optional<NotCarried> WhyChaptersStay(const SourceInfo& source, const Request& request,
                                           const FileFormatInfo& format) {
-    const bool can = (MWGetFormatTraits(format.fccFormat) & kWriterFormatChapters) != 0;
+    const bool can =
+        (MWGetFormatTraits(format.fccFormat) & kWriterFormatChapters) != 0 || HoldsChapterTexts(format);
     if (can || source.chapters.empty() || request.noChapters)
         return std::nullopt;
     return NotCarried{"chapters", std::nullopt, {}, {}, fmt::format("{} cannot hold them", NameOf(format))};
@@ -322,7 +351,9 @@ std::vector<NotCarried> CarryOver(Movie& movie, const Request& request, const Fi
     if (std::optional<NotCarried> chapters = WhyChaptersStay(source, request, format))
         left.push_back(*std::move(chapters));
     else if (!request.noChapters)
-        if (const int wrong = CarryChapters(source, writerSet); wrong != 0)
+        if (const int wrong = HoldsChapterTexts(format) ? CarryChapterTexts(source, request, writerSet)
+                                                        : CarryChapters(source, writerSet);
+            wrong != 0)
             left.push_back(
                 {"chapters", std::nullopt, {}, {}, fmt::format("{} of them have no length", wrong)});
     FurtherTracks tracks(movie, request, format, writerSet);

@@ -10,36 +10,60 @@ struct Language {
     std::string_view two;
     std::string_view three;
     std::string_view other; // three letters made from the language's own name
+    std::string_view name;  // in English
 };
 
 // clang-format off
 constexpr Language kLanguages[] = {
-    {"ar", "ara", {}},    {"bg", "bul", {}},    {"bn", "ben", {}},    {"ca", "cat", {}},    {"cs", "cze", "ces"},
-    {"cy", "wel", "cym"}, {"da", "dan", {}},    {"de", "ger", "deu"}, {"el", "gre", "ell"}, {"en", "eng", {}},
-    {"es", "spa", {}},    {"et", "est", {}},    {"eu", "baq", "eus"}, {"fa", "per", "fas"}, {"fi", "fin", {}},
-    {"fr", "fre", "fra"}, {"ga", "gle", {}},    {"gl", "glg", {}},    {"he", "heb", {}},    {"hi", "hin", {}},
-    {"hr", "hrv", {}},    {"hu", "hun", {}},    {"hy", "arm", "hye"}, {"id", "ind", {}},    {"is", "ice", "isl"},
-    {"it", "ita", {}},    {"ja", "jpn", {}},    {"ka", "geo", "kat"}, {"ko", "kor", {}},    {"lt", "lit", {}},
-    {"lv", "lav", {}},    {"mk", "mac", "mkd"}, {"ms", "may", "msa"}, {"nb", "nob", {}},    {"nl", "dut", "nld"},
-    {"nn", "nno", {}},    {"no", "nor", {}},    {"pl", "pol", {}},    {"pt", "por", {}},    {"ro", "rum", "ron"},
-    {"ru", "rus", {}},    {"sk", "slo", "slk"}, {"sl", "slv", {}},    {"sq", "alb", "sqi"}, {"sr", "srp", {}},
-    {"sv", "swe", {}},    {"ta", "tam", {}},    {"te", "tel", {}},    {"th", "tha", {}},    {"tr", "tur", {}},
-    {"uk", "ukr", {}},    {"ur", "urd", {}},    {"vi", "vie", {}},    {"zh", "chi", "zho"},
+    {"ar", "ara", {}, "Arabic"},         {"bg", "bul", {}, "Bulgarian"},      {"bn", "ben", {}, "Bengali"},
+    {"ca", "cat", {}, "Catalan"},        {"cs", "cze", "ces", "Czech"},       {"cy", "wel", "cym", "Welsh"},
+    {"da", "dan", {}, "Danish"},         {"de", "ger", "deu", "German"},      {"el", "gre", "ell", "Greek"},
+    {"en", "eng", {}, "English"},        {"es", "spa", {}, "Spanish"},        {"et", "est", {}, "Estonian"},
+    {"eu", "baq", "eus", "Basque"},      {"fa", "per", "fas", "Persian"},     {"fi", "fin", {}, "Finnish"},
+    {"fr", "fre", "fra", "French"},      {"ga", "gle", {}, "Irish"},          {"gl", "glg", {}, "Galician"},
+    {"he", "heb", {}, "Hebrew"},         {"hi", "hin", {}, "Hindi"},          {"hr", "hrv", {}, "Croatian"},
+    {"hu", "hun", {}, "Hungarian"},      {"hy", "arm", "hye", "Armenian"},    {"id", "ind", {}, "Indonesian"},
+    {"is", "ice", "isl", "Icelandic"},   {"it", "ita", {}, "Italian"},        {"ja", "jpn", {}, "Japanese"},
+    {"ka", "geo", "kat", "Georgian"},    {"ko", "kor", {}, "Korean"},         {"lt", "lit", {}, "Lithuanian"},
+    {"lv", "lav", {}, "Latvian"},        {"mk", "mac", "mkd", "Macedonian"},  {"ms", "may", "msa", "Malay"},
+    {"nb", "nob", {}, "Norwegian Bokmål"}, {"nl", "dut", "nld", "Dutch"},       {"nn", "nno", {}, "Norwegian Nynorsk"},
+    {"no", "nor", {}, "Norwegian"},      {"pl", "pol", {}, "Polish"},         {"pt", "por", {}, "Portuguese"},
+    {"ro", "rum", "ron", "Romanian"},    {"ru", "rus", {}, "Russian"},        {"sk", "slo", "slk", "Slovak"},
+    {"sl", "slv", {}, "Slovenian"},      {"sq", "alb", "sqi", "Albanian"},    {"sr", "srp", {}, "Serbian"},
+    {"sv", "swe", {}, "Swedish"},        {"ta", "tam", {}, "Tamil"},          {"te", "tel", {}, "Telugu"},
+    {"th", "tha", {}, "Thai"},           {"tr", "tur", {}, "Turkish"},        {"uk", "ukr", {}, "Ukrainian"},
+    {"ur", "urd", {}, "Urdu"},           {"vi", "vie", {}, "Vietnamese"},     {"zh", "chi", "zho", "Chinese"},
 };
 // clang-format on
+
+std::string Small(std::string_view code) {
+    std::string small(code);
+    std::transform(small.begin(), small.end(), small.begin(),
+                   [](unsigned char letter) { return static_cast<char>(std::tolower(letter)); });
+    return small;
+}
+
+/// Null when it is not known.
+const Language* Find(const std::string& small) {
+    const std::string code = small.substr(0, small.find('-'));
+    const auto* const found =
+        std::find_if(std::begin(kLanguages), std::end(kLanguages), [&](const Language& each) {
+            return code == each.two || code == each.three || (!code.empty() && code == each.other);
+        });
+    return found != std::end(kLanguages) ? found : nullptr;
+}
 
 } // namespace
 
 std::string ThreeLetters(std::string_view code) {
-    std::string small(code);
-    std::transform(small.begin(), small.end(), small.begin(),
-                   [](unsigned char letter) { return static_cast<char>(std::tolower(letter)); });
-    const std::string language = small.substr(0, small.find('-'));
-    const auto* const found =
-        std::find_if(std::begin(kLanguages), std::end(kLanguages), [&](const Language& each) {
-            return language == each.two || language == each.three || language == each.other;
-        });
-    return found != std::end(kLanguages) ? std::string(found->three) : small;
+    const std::string small = Small(code);
+    const Language* language = Find(small);
+    return language != nullptr ? std::string(language->three) : small;
+}
+
+std::string LanguageName(std::string_view code) {
+    const Language* language = Find(Small(code));
+    return std::string(language != nullptr ? language->name : code);
 }
 
 } // namespace movieconv

@@ -11,6 +11,9 @@ namespace movieconv {
 /// or three letters, of which a region may follow behind a dash; other texts in small letters as they are.
 std::string ThreeLetters(std::string_view code);
 
+/// The English name of the language, "French"; of one that is not known the code as it is.
+std::string LanguageName(std::string_view code);
+
 } // namespace movieconv
 
 #endif

@@ -1,6 +1,7 @@
 #include "host/terminal/TextReporter.h"
 
 #include "host/convert/Amounts.h"
+#include "host/source/Languages.h"
 
 #include <algorithm>
 #include <array>
@@ -86,7 +87,7 @@ void SparseReporter::LeftBehind(const NotCarried& report) {
     const std::string number = report.number ? fmt::format(" {}", *report.number) : std::string();
     std::string details(NameForUsers(report.codec));
     if (!report.language.empty())
-        details += (details.empty() ? "" : ", ") + report.language;
+        details += (details.empty() ? "" : ", ") + LanguageName(report.language);
     if (!details.empty())
         details = " (" + details + ")";
     LeaveLine();

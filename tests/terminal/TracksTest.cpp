@@ -178,7 +178,8 @@ TEST(Tracks, TextsComeInTheFormatsOwnFormAndAreCutWithTheMovie) {
         EXPECT_EQ(decoded.err, "");
     }
     const Result other = Call({WithTexts(), folder / "a.avi", "--progress", "none"});
-    EXPECT_EQ(other.err, "movieconv: not carried: subtitles 1 (SRT, fre): AVI cannot hold them, MKV can\n");
+    EXPECT_EQ(other.err,
+              "movieconv: not carried: subtitles 1 (SRT, French): AVI cannot hold them, MKV can\n");
 }
 
 TEST(Tracks, CarriedOnceMoreTheyStayAsTheyAre) {
