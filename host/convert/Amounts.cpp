@@ -29,4 +29,8 @@ std::string FormatBytes(int64_t bytes) {
     return fmt::format("{:.1f} {}", value, kUnits[unit]);
 }
 
+std::string FormatByteRange(int64_t least, int64_t most) {
+    return fmt::format("{} to {}", FormatBytes(least), FormatBytes(most));
+}
+
 } // namespace movieconv

@@ -13,6 +13,9 @@ std::string FormatTime(double seconds, bool milliseconds = false);
 /// "812 B", "3.1 kB", "41.3 MB", powers of 1000.
 std::string FormatBytes(int64_t bytes);
 
+/// "1.2 GB to 1.9 GB".
+std::string FormatByteRange(int64_t least, int64_t most);
+
 } // namespace movieconv
 
 #endif

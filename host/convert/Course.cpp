@@ -86,9 +86,11 @@ Verdict Course::Run() {
         observer_.Warned({Warning::Kind::kChosen, TellSize(request_)});
     if (!request_.piece && request_.detectCrop && movie_.Info().pictures)
         observer_.Warned({Warning::Kind::kChosen, TellCrop(*movie_.Info().pictures)});
-    if (!request_.piece && (lengthKnown || request_.length) &&
-        HasRates(request_, ChooseFormat(request_), movie_.Info()))
-        WarnOfSmallRoom();
+    if (!request_.piece && (lengthKnown || request_.length)) {
+        sizeIsKnown_ = HasRates(request_, ChooseFormat(request_), movie_.Info());
+        if (sizeIsKnown_)
+            CheckKnownSize();
+    }
     clock_.Skip(WorkClock::Now());
     if (request_.firstClip)
         RunClip();
@@ -150,16 +152,30 @@ void Course::AwaitResume() {
     UpdateClock();
 }
 
-void Course::WarnOfSmallRoom() {
+/// When there is less room than for so many further bytes; once.
+void Course::WarnOfSmallRoom(int64_t further, const std::string& needed) {
+    const int64_t free = FreeBytes(text::FolderOf(request_.output));
+    if (roomIsSmall_ || free < 0 || free >= further)
+        return;
+    roomIsSmall_ = true;
+    observer_.Warned({Warning::Kind::kSmallRoom, fmt::format("\"{}\" needs about {}, but only {} are free",
+                                                             request_.output, needed, FormatBytes(free))});
+}
+
+void Course::CheckKnownSize() {
     EncodeParam param{};
     MCGetEncodeParam(engine_.get(), &param);
     const int64_t needed = MCGetEstimateDiskSpaceEx(&param, length_);
-    const int64_t free = FreeBytes(text::FolderOf(request_.output));
-    if (free >= 0 && free < needed) {
-        observer_.Warned({Warning::Kind::kSmallRoom,
-                          fmt::format("\"{}\" needs about {}, but only {} are free", request_.output,
-                                      FormatBytes(needed), FormatBytes(free))});
-    }
+    WarnOfSmallRoom(needed, FormatBytes(needed));
+}
+
+/// Warns when not even the middle of what is expected finds room.
+void Course::CheckExpectedSize(const Progress& report) {
+    if (!report.expected || roomIsSmall_ || report.phase != Phase::kConverting)
+        return;
+    const ByteRange& whole = *report.expected;
+    WarnOfSmallRoom(whole.least + (whole.most - whole.least) / 2 - report.bytes,
+                    FormatByteRange(whole.least - report.bytes, whole.most - report.bytes) + " more");
 }
 
 /// The engine's worker calls this.
@@ -183,6 +199,8 @@ void Course::WaitForEnd() {
         FollowWishes();
         TakeNews();
         Show();
+        if (!sizeIsKnown_)
+            size_.Add(Reached(), watch_.Bytes());
         LookAfterFile();
         if (outcome_ == kNone)
             ReportProgress();
@@ -263,10 +281,14 @@ double Course::Converted(double position) const {
     return std::clamp(position, 0.0, request_.length ? length_ : std::numeric_limits<double>::max());
 }
 
+/// While the rest of the sound is converted after the last picture, only the sound tells how far it is.
+double Course::Reached() const {
+    return Converted(std::max(Position(), movie_.SoundSeconds()));
+}
+
 Progress Course::Figures() {
     Progress report;
-    // While the rest of the sound is converted after the last picture, only the sound tells how far it is.
-    report.position = Converted(std::max(Position(), movie_.SoundSeconds()));
+    report.position = Reached();
     report.length = length_;
     report.worked = clock_.Seconds();
     speed_.Add(report.worked, report.position);
@@ -276,6 +298,8 @@ Progress Course::Figures() {
         report.left = speed_.Left(length_);
     }
     report.bytes = watch_.Bytes();
+    if (!sizeIsKnown_)
+        report.expected = size_.Total(length_);
     report.finished = files_.Finishing().value_or(0);
     report.clip = request_.split ? files_.Opened() : 0;
     return report;
@@ -305,6 +329,7 @@ void Course::ReportProgress() {
     report.phase = phase;
     report.phaseChanged = changed;
     observer_.Progressed(report);
+    CheckExpectedSize(report);
 }
 
 Verdict Course::Conclude() {

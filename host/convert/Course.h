@@ -10,6 +10,7 @@
 #include "host/convert/Observer.h"
 #include "host/convert/PictureTap.h"
 #include "host/convert/Request.h"
+#include "host/convert/SizeForecast.h"
 #include "host/convert/SpeedMeter.h"
 #include "host/convert/WorkClock.h"
 #include "host/convert/WriterWatch.h"
@@ -53,7 +54,9 @@ private:
     void RunEngine(double begin, double length);
     bool GoesOn();
     void AwaitResume();
-    void WarnOfSmallRoom();
+    void WarnOfSmallRoom(int64_t further, const std::string& needed);
+    void CheckKnownSize();
+    void CheckExpectedSize(const Progress& report);
     void WaitForEnd();
     void FollowWishes();
     void TakeNews();
@@ -68,6 +71,7 @@ private:
     Verdict Conclude();
     double Position() const;
     double Converted(double position) const;
+    double Reached() const;
     std::string WhyItEndedEarly() const;
     void ReportComplaints();
 
@@ -87,6 +91,9 @@ private:
 
     WorkClock clock_;
     SpeedMeter speed_;
+    SizeForecast size_;
+    bool sizeIsKnown_ = true;  // or cannot be told at all, without a length
+    bool roomIsSmall_ = false; // which was told
     bool paused_ = false;
     bool userStopped_ = false;
     bool cutShort_ = false;            // by the user, before the engine's end was known

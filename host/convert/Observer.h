@@ -26,6 +26,11 @@ struct Start {
     bool lengthIsKnown; ///< False when it is a guess.
 };
 
+struct ByteRange {
+    int64_t least;
+    int64_t most;
+};
+
 struct Progress {
     Phase phase = Phase::kConverting;
     bool phaseChanged = false; ///< Since the last report.
@@ -35,9 +40,11 @@ struct Progress {
     std::optional<double> speed;   ///< Seconds of source a second of work.
     std::optional<double> left;    ///< Seconds of work for the rest.
     int64_t bytes = 0;             ///< In the output so far, all clips.
-    double worked = 0;             ///< Seconds, pauses left out.
-    double finished = 0;           ///< Of the finishing phase, 0 to 1.
-    int clip = 0;                  ///< Number of the open clip from 1; 0 without splitting.
+    /// Bytes that the whole output is going to have, about: where no rate tells it before, after ten seconds.
+    std::optional<ByteRange> expected;
+    double worked = 0;   ///< Seconds, pauses left out.
+    double finished = 0; ///< Of the finishing phase, 0 to 1.
+    int clip = 0;        ///< Number of the open clip from 1; 0 without splitting.
 };
 
 struct OpenedFile {

@@ -2,15 +2,12 @@
 #ifndef MOVIECONV_HOST_CONVERT_SIZEFORECAST_H
 #define MOVIECONV_HOST_CONVERT_SIZEFORECAST_H
 
+#include "host/convert/Observer.h"
+
 #include <cstdint>
 #include <optional>
 
 namespace movieconv {
-
-struct ByteRange {
-    int64_t least;
-    int64_t most;
-};
 
 /// For outputs whose size follows from a quality and not from rates. The range is the wider the more the rate
 /// has varied, and closes in as the rest gets shorter. The truth may still lie outside: what follows may be

@@ -64,12 +64,14 @@ void JsonReporter::Progressed(const Progress& report) {
     if (!report.phaseChanged && report.worked < nextAt_)
         return;
     nextAt_ = report.worked + kReportInterval;
+    const std::string expected =
+        report.expected ? fmt::format("[{},{}]", report.expected->least, report.expected->most) : "null";
     Print("progress",
           fmt::format("\"phase\":\"{}\",\"percent\":{},\"position_s\":{},\"speed\":{},\"left_s\":{},"
-                      "\"worked_s\":{},\"bytes\":{},\"finished\":{},\"clip\":{}",
+                      "\"worked_s\":{},\"bytes\":{},\"expected_bytes\":{},\"finished\":{},\"clip\":{}",
                       PhaseName(report.phase), Number(report.percent), Number(report.position),
                       Number(report.speed), Number(report.left), Number(report.worked), report.bytes,
-                      Number(report.finished), report.clip));
+                      expected, Number(report.finished), report.clip));
 }
 
 void JsonReporter::Opened(const OpenedFile& report) {

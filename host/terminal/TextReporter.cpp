@@ -66,10 +66,13 @@ std::string ProgressText(const Progress& report, int columns) {
                                      ? FormatTime(report.position) + " / " + FormatTime(report.length)
                                      : FormatTime(report.position);
     const std::string speed = report.speed ? fmt::format("{:5.2f}x", *report.speed) : std::string("     -");
+    const std::string expected = report.expected
+                                     ? " of " + FormatByteRange(report.expected->least, report.expected->most)
+                                     : std::string();
     std::string line = percent;
     const std::string clip = report.clip > 0 ? fmt::format("  clip {}", report.clip) : std::string();
-    for (const std::string& part :
-         {"  " + position, "  " + speed, "  " + Left(report), "  " + FormatBytes(report.bytes), clip})
+    for (const std::string& part : {"  " + position, "  " + speed, "  " + Left(report),
+                                    "  " + FormatBytes(report.bytes), expected, clip})
         if (line.size() + part.size() < static_cast<std::size_t>(columns))
             line += part;
     return line;

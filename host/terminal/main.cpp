@@ -57,7 +57,8 @@ ExitCode Estimate(const Options& options, const StandardStreams& streams) {
     const Room room = EstimateRoom(options.request);
     PrintWhole(streams,
                room.needed < 0
-                   ? fmt::format("how much {} of output need is unknown: the quality decides, not a rate\n",
+                   ? fmt::format("how much {} of output need is unknown: the quality decides, not a rate;\n"
+                                 "the conversion tells it after its first ten seconds\n",
                                  FormatTime(room.length, true))
                    : fmt::format("needs about {} for {} of output\n", FormatBytes(room.needed),
                                  FormatTime(room.length, true)));

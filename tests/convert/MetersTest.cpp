@@ -1,4 +1,5 @@
 #include "host/convert/Amounts.h"
+#include "host/convert/SizeForecast.h"
 #include "host/convert/SpeedMeter.h"
 #include "host/convert/WorkClock.h"
 
@@ -41,6 +42,38 @@ TEST(SpeedMeter, FollowsTheLastTenSeconds) {
     EXPECT_NEAR(*meter.Speed(), 4, 0.3);
     EXPECT_NEAR(*meter.Left(104), 10, 1);
     EXPECT_EQ(*meter.Left(1), 0);
+}
+
+/// Of 100 seconds, after so many of them were converted in steps of half a second.
+std::optional<ByteRange> Foretell(double seconds, double rate(double position)) {
+    SizeForecast forecast;
+    double bytes = 5000; // the head
+    for (double position = 0; position <= seconds; position += 0.5) {
+        forecast.Add(position, static_cast<int64_t>(bytes));
+        bytes += rate(position) / 2;
+    }
+    return forecast.Total(100);
+}
+
+TEST(SizeForecast, NarrowsDownToTheTruth) {
+    const auto steady = [](double) { return 1000.0; };
+    const auto moody = [](double position) { return static_cast<int>(position) % 8 < 4 ? 400.0 : 1600.0; };
+    EXPECT_FALSE(Foretell(9.5, steady));
+    for (const auto& [rate, truth] : {std::pair(+steady, 105'000), std::pair(+moody, 102'600)}) {
+        int64_t width = 1'000'000;
+        for (const double seconds : {10.0, 40.0, 80.0, 100.0}) {
+            const auto range = Foretell(seconds, rate);
+            ASSERT_TRUE(range) << seconds;
+            EXPECT_LE(range->least, truth) << seconds;
+            EXPECT_GE(range->most, truth) << seconds;
+            EXPECT_LT(range->most - range->least, width) << seconds;
+            width = range->most - range->least;
+        }
+    }
+    const auto even = Foretell(40, steady);
+    const auto uneven = Foretell(40, moody);
+    EXPECT_LT((even->most - even->least) * 2, uneven->most - uneven->least);
+    EXPECT_FALSE(Foretell(40, [](double) { return 0.0; })) << "nothing is written";
 }
 
 } // namespace

@@ -17,7 +17,9 @@ TEST(ProgressText, FitsTheTerminalAndNeverRoundsUp) {
     report.bytes = 1'234'567;
     const std::string text = ProgressText(report, 1000);
     EXPECT_EQ(text, " 42.9%  0:01:01 / 1:00:00   3.50x  left 0:01:00  1.2 MB");
-    for (int columns = 10; columns < 60; ++columns)
+    report.expected = {30'000'000, 45'600'000};
+    EXPECT_EQ(ProgressText(report, 1000), text + " of 30.0 MB to 45.6 MB");
+    for (int columns = 10; columns < 80; ++columns)
         EXPECT_LT(ProgressText(report, columns).size(), static_cast<std::size_t>(columns));
     report.percent.reset();
     EXPECT_EQ(ProgressText(report, 1000).find('%'), std::string::npos);

@@ -45,6 +45,7 @@ void ScriptedRunner::Script::Figure(double position, double length, double speed
     figures.speed = speed;
     figures.left = (length - position) / speed;
     figures.bytes = static_cast<int64_t>(position * 100'000);
+    figures.expected = {5'000'000, 7'000'000};
     listener->OnFigures(figures);
 }
 

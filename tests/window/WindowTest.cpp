@@ -354,6 +354,7 @@ TEST_F(WindowTest, ConvertsWithALivePicture) {
     Script(0).listener->OnPicture(runner.PictureAt({}, 0, 64));
     ASSERT_TRUE(Await([&] { return !The<PictureView>()->Picture().isNull(); }));
     EXPECT_EQ(Named<QLabel>("Progress in percent")->text(), "50.0 %");
+    EXPECT_EQ(Named<QLabel>("Written")->text(), "3.0 MB of 5.0 MB to 7.0 MB");
     EXPECT_TRUE(Window().windowTitle().startsWith(QStringLiteral("25 %")));
     Script(0).End(Ending::kDone);
     ASSERT_TRUE(AwaitScripts(2)); // the window goes on to the next movie

@@ -57,9 +57,7 @@ private:
         if (posted_)
             return;
         posted_ = true;
-        QMetaObject::invokeMethod(
-            dispatcher_, [dispatcher = dispatcher_, id = id_] { dispatcher->Collect(id); },
-            Qt::QueuedConnection);
+        dispatcher_->inbox_.Put([dispatcher = dispatcher_, id = id_] { dispatcher->Collect(id); });
     }
 
     Dispatcher* dispatcher_;

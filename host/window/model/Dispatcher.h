@@ -86,6 +86,7 @@ private:
 
     Queue& queue_;
     Runner& runner_;
+    Inbox inbox_; // of the runs' news
     std::map<quint64, Active> active_;
     int atOnce_ = 1;
     bool working_ = false;

@@ -56,7 +56,7 @@ void Queue::Add(std::vector<std::string> paths) {
     worker_.Do(0, [this, paths = std::move(paths)] {
         QStringList complaints;
         std::vector<std::string> movies = FindMovies(paths, complaints);
-        QMetaObject::invokeMethod(this, [this, movies = std::move(movies), complaints] {
+        inbox_.Put([this, movies = std::move(movies), complaints] {
             --searches_;
             Append(movies);
             for (const QString& complaint : complaints)
@@ -272,7 +272,7 @@ void Queue::Examine(quint64 id) {
         } catch (const std::runtime_error& error) {
             found.unusable = QString::fromUtf8(error.what());
         }
-        QMetaObject::invokeMethod(this, [this, id, seen, found] {
+        inbox_.Put([this, id, seen, found] {
             const Entry* now = Find(id);
             if (now == nullptr || now->state != seen.state || now->wishes != seen.wishes ||
                 now->target != seen.target || now->replace != seen.replace)

@@ -2,6 +2,7 @@
 #ifndef MOVIECONV_HOST_WINDOW_MODEL_QUEUE_H
 #define MOVIECONV_HOST_WINDOW_MODEL_QUEUE_H
 
+#include "host/window/model/Inbox.h"
 #include "host/window/model/Journal.h"
 #include "host/window/model/Naming.h"
 #include "host/window/model/Worker.h"
@@ -96,6 +97,7 @@ private:
     Naming naming_;
     Wishes defaults_;
     int searches_ = 0;
+    Inbox inbox_;   // of the worker's results
     Worker worker_; // last: its tasks refer to the rest
 };
 

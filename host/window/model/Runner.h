@@ -93,6 +93,11 @@ struct Findings {
 
 enum class Phase { kPreparing, kConverting, kPaused, kWaitingForRoom, kFinishing, kStopping };
 
+struct Bounds {
+    int64_t least;
+    int64_t most;
+};
+
 struct Figures {
     Phase phase = Phase::kPreparing;
     double position = 0; ///< Seconds of the movie converted.
@@ -102,6 +107,8 @@ struct Figures {
     std::optional<double> left;  ///< Seconds.
     double worked = 0;           ///< Seconds, pauses left out.
     int64_t bytes = 0;
+    std::optional<Bounds>
+        expected; ///< Bytes in the end, where that is not known before but can be guessed by now.
 };
 
 enum class Ending { kDone, kStopped, kFailed };

@@ -107,6 +107,8 @@ public:
         figures.left = progress.left;
         figures.worked = progress.worked;
         figures.bytes = progress.bytes;
+        if (progress.expected)
+            figures.expected = {progress.expected->least, progress.expected->most};
         listener_->OnFigures(figures);
     }
     void LeftBehind(const NotCarried& what) override { leftBehind_ += LineOf(what); }

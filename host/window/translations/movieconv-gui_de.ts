@@ -1403,5 +1403,9 @@
         <source>&amp;Pause</source>
         <translation>An&amp;halten</translation>
     </message>
+    <message>
+        <source>%1 of %2 to %3</source>
+        <translation>%1 von %2 bis %3</translation>
+    </message>
 </context>
 </TS>

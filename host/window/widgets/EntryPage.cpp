@@ -28,12 +28,9 @@ namespace {
 constexpr int kStripWidth = 160; // of one of its pictures, in pixels
 constexpr std::array kHeights = {2160, 1440, 1080, 720, 576, 480, 360};
 
-/// Of a row that grows downwards: its first line stands beside the label.
-QLabel* MakeTopLabel(const QString& words) {
-    auto* label = new QLabel(words);
-    label->setAlignment(Qt::AlignRight | Qt::AlignTop);
-    label->setContentsMargins(0, 3, 0, 0);
-    return label;
+/// Of a row whose first line is a box to tick.
+int HeightOfTick() {
+    return QCheckBox().sizeHint().height() + 2 * TrackChoice::kMargin;
 }
 
 } // namespace
@@ -166,8 +163,9 @@ void EntryPage::AddTracks(QFormLayout* form) {
     layout->setSpacing(6);
     layout->addWidget(subtitles_);
     layout->addWidget(subtitleFiles_);
-    soundsLabel_ = MakeTopLabel(tr("Sound tracks"));
-    subtitlesLabel_ = MakeTopLabel(tr("Subtitles"));
+    soundsLabel_ = new QLabel(tr("Sound tracks"));
+    soundsLabel_->setFixedHeight(HeightOfTick());
+    subtitlesLabel_ = new QLabel(tr("Subtitles"));
     form->addRow(soundsLabel_, sounds_);
     form->addRow(subtitlesLabel_, texts);
 }
@@ -346,6 +344,7 @@ void EntryPage::ShowTracks() {
     subtitleFiles_->Show(entry_.wishes.subtitleFiles, entry_.source);
     subtitleFiles_->setVisible(known);
     subtitlesLabel_->setVisible(known);
+    subtitlesLabel_->setFixedHeight(subtitles.empty() ? browse_->sizeHint().height() : HeightOfTick());
 }
 
 void EntryPage::ShowFindings() {

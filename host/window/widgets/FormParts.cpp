@@ -5,7 +5,7 @@ namespace movieconv::window {
 QLabel* MakeRowLabel(const QString& words, QWidget* field) {
     auto* label = new QLabel(words);
     label->setBuddy(field);
-    label->setMinimumHeight(field->sizeHint().height());
+    label->setFixedHeight(field->sizeHint().height()); // also where more stands below the field
     return label;
 }
 

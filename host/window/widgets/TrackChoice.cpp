@@ -16,7 +16,7 @@ constexpr qsizetype kMany = 4;
 TrackChoice::TrackChoice(const QString& name, QWidget* parent)
     : QWidget(parent), few_(new QWidget), layout_(new QVBoxLayout(this)) {
     setAccessibleName(name);
-    layout_->setContentsMargins(0, 3, 0, 0); // so that the first one stands beside the row's label
+    layout_->setContentsMargins(0, kMargin, 0, 0);
     layout_->setSpacing(4);
     auto* row = new QHBoxLayout(few_);
     row->setContentsMargins(0, 0, 0, 0);

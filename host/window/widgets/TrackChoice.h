@@ -15,6 +15,8 @@ namespace movieconv::window {
 class TrackChoice : public QWidget {
     Q_OBJECT
 public:
+    static constexpr int kMargin = 3; ///< Pixels above the first box.
+
     /// `name`: of all of them together, for screen readers.
     explicit TrackChoice(const QString& name, QWidget* parent = nullptr);
 

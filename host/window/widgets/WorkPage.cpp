@@ -138,7 +138,10 @@ void WorkPage::Show(const Entry& entry) {
     SetText(*position_, figures.length > 0
                             ? tr("%1 of %2").arg(ClockText(figures.position), ClockText(figures.length))
                             : ClockText(figures.position));
-    SetText(*bytes_, BytesText(figures.bytes));
+    SetText(*bytes_, figures.expected ? tr("%1 of %2 to %3")
+                                            .arg(BytesText(figures.bytes), BytesText(figures.expected->least),
+                                                 BytesText(figures.expected->most))
+                                      : BytesText(figures.bytes));
     const QString words = paused_ ? tr("&Resume") : tr("&Pause");
     if (pause_->text() != words) {
         pause_->setText(words);
