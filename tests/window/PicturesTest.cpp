@@ -216,7 +216,8 @@ TEST_F(PicturesTest, CarriesTheTracksThatAreChosen) {
     app.TheQueue().SetWishes(At(0).id, wishes);
     AwaitExamined(1);
     const QString notes = At(0).findings.notes.join(QLatin1Char('\n'));
-    for (const char* told : {"sound 2 (aac, ger)", "subtitles 3 (subrip, fre)", "subtitles (subrip, ger)"})
+    for (const char* told :
+         {"sound 2 (aac, German)", "subtitles 3 (subrip, French)", "subtitles (subrip, German)"})
         EXPECT_TRUE(notes.contains(QLatin1String(told))) << notes.toStdString();
     EXPECT_TRUE(At(0).findings.warnings.isEmpty());
 

@@ -9,6 +9,7 @@
 #include "host/convert/Sources.h"
 #include "host/convert/StillPicture.h"
 #include "host/window/model/Words.h"
+#include "host/window/runner/LibraryWords.h"
 #include "host/window/runner/PresetShelf.h"
 #include "host/window/runner/Translation.h"
 #include "text/Path.h"
@@ -65,20 +66,6 @@ QString FailureSentence(const Failure& failure) {
     else if (failure.Kind() == Category::kOutput)
         advice = Texts::tr("Choose another folder that you may write to.");
     return advice.isEmpty() ? what : what + QLatin1Char(' ') + advice;
-}
-
-/// "subtitles 3 (hdmv_pgs_subtitle, ger): MP4 cannot hold them".
-QString LineOf(const NotCarried& what) {
-    QString line = QString::fromStdString(what.kind);
-    if (what.number)
-        line += QStringLiteral(" %1").arg(*what.number);
-    QStringList details;
-    for (const std::string& detail : {what.codec, what.language})
-        if (!detail.empty())
-            details += QString::fromStdString(detail);
-    if (!details.isEmpty())
-        line += QStringLiteral(" (%1)").arg(details.join(QStringLiteral(", ")));
-    return QStringLiteral("%1: %2").arg(line, QString::fromStdString(what.reason));
 }
 
 /// Hears a job and tells a listener in the window's terms.

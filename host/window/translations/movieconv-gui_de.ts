@@ -234,6 +234,85 @@
     </message>
 </context>
 <context>
+    <name>Library</name>
+    <message>
+        <source>%1 cannot hold them</source>
+        <translation>%1 kann sie nicht aufnehmen</translation>
+    </message>
+    <message>
+        <source>%1 cannot hold them, MKV can</source>
+        <translation>%1 kann sie nicht aufnehmen, MKV kann es</translation>
+    </message>
+    <message>
+        <source>%1 cannot hold it</source>
+        <translation>%1 kann das nicht aufnehmen</translation>
+    </message>
+    <message>
+        <source>%1 holds one track of sound, MKV and MP4 hold several</source>
+        <translation>%1 hat eine Tonspur, MKV und MP4 haben mehrere</translation>
+    </message>
+    <message>
+        <source>%1 of them have no length</source>
+        <translation>%1 davon haben keine Länge</translation>
+    </message>
+    <message>
+        <source>it cannot be decoded</source>
+        <translation>lässt sich nicht dekodieren</translation>
+    </message>
+    <message>
+        <source>it belongs to another programme</source>
+        <translation>gehört zu einem anderen Programm</translation>
+    </message>
+    <message>
+        <source>one stream of pictures is converted</source>
+        <translation>nur eine Bildspur wird umgewandelt</translation>
+    </message>
+    <message>
+        <source>data streams are not converted</source>
+        <translation>Datenspuren werden nicht umgewandelt</translation>
+    </message>
+    <message>
+        <source>only one cover is carried</source>
+        <translation>nur ein Titelbild wird übernommen</translation>
+    </message>
+    <message>
+        <source>it is neither JPEG nor PNG</source>
+        <translation>ist weder JPEG noch PNG</translation>
+    </message>
+    <message>
+        <source>it has no name or no content</source>
+        <translation>hat keinen Namen oder keinen Inhalt</translation>
+    </message>
+    <message>
+        <source>pictures</source>
+        <translation>Bilder</translation>
+    </message>
+    <message>
+        <source>sound</source>
+        <translation>Ton</translation>
+    </message>
+    <message>
+        <source>subtitles</source>
+        <translation>Untertitel</translation>
+    </message>
+    <message>
+        <source>chapters</source>
+        <translation>Kapitel</translation>
+    </message>
+    <message>
+        <source>cover</source>
+        <translation>Titelbild</translation>
+    </message>
+    <message>
+        <source>attachment</source>
+        <translation>Anhang</translation>
+    </message>
+    <message>
+        <source>data</source>
+        <translation>Daten</translation>
+    </message>
+</context>
+<context>
     <name>LogShare</name>
     <message>
         <source>There is more, which is left out.</source>
