@@ -19,7 +19,7 @@ void FilterGraph::GraphFree::operator()(AVFilterGraph* graph) const {
     Filters().avfilter_graph_free(&graph);
 }
 
-FilterGraph::FilterGraph(const AVFrame& form, const std::string& chain, int threads)
+FilterGraph::FilterGraph(const AVFrame& form, const std::string& chain, int threads, AVRational unit)
     : graph_(Filters().avfilter_graph_alloc()),
       width_(form.width),
       height_(form.height),
@@ -29,7 +29,8 @@ FilterGraph::FilterGraph(const AVFrame& form, const std::string& chain, int thre
     graph_->nb_threads = threads;
     const std::string description = "video_size=" + std::to_string(width_) + "x" + std::to_string(height_) +
                                     ":pix_fmt=" + std::to_string(format_) +
-                                    ":time_base=1/25:pixel_aspect=1/1";
+                                    ":time_base=" + std::to_string(unit.num) + "/" +
+                                    std::to_string(unit.den) + ":pixel_aspect=1/1";
     Check(Filters().avfilter_graph_create_filter(&entry_, Filters().avfilter_get_by_name("buffer"), "in",
                                                  description.c_str(), nullptr, graph_.get()));
     Check(Filters().avfilter_graph_create_filter(&exit_, Filters().avfilter_get_by_name("buffersink"), "out",

@@ -16,9 +16,9 @@ namespace av {
 /// or std::bad_alloc.
 class FilterGraph {
 public:
-    /// For pictures such as `form`. `chain` is in FFmpeg's notation, from one open end to the other. 0
-    /// threads: as many as there are processors.
-    FilterGraph(const AVFrame& form, const std::string& chain, int threads = 0);
+    /// For pictures such as `form`, whose stamps count in `unit`. `chain` is in FFmpeg's notation, from one
+    /// open end to the other. 0 threads: as many as there are processors.
+    FilterGraph(const AVFrame& form, const std::string& chain, int threads = 0, AVRational unit = {1, 25});
     ~FilterGraph();
 
     /// Whether the picture is of the size and format that the graph is made for.

@@ -11,6 +11,7 @@ extern "C" {
 #include <algorithm>
 #include <cctype>
 #include <cstring>
+#include <string_view>
 #include <utility>
 
 namespace writer {
@@ -96,6 +97,29 @@ constexpr uint32_t kChapters = kWriterFormatChapters;
 constexpr uint32_t kCover = kWriterFormatCover;
 constexpr uint32_t kFiles = kWriterFormatAttachments;
 constexpr uint32_t kTracks = kWriterFormatTracks;
+constexpr uint32_t kLanguages = kWriterFormatLanguages;
+constexpr uint32_t kTitles = kWriterFormatTrackTitles;
+// What the multiplexers write of all that can be said about a movie.
+constexpr const char* kMp4Tags = "title,artist,album,album_artist,composer,genre,date,track,disc,comment,description,"
+                                 "synopsis,copyright,creation_time,location,lyrics,grouping,show,season_number,"
+                                 "episode_id,episode_sort,network,keywords,media_type,compilation,gapless_playback,"
+                                 "hd_video";
+constexpr const char* kMovTags = "title,artist,author,album,genre,date,comment,copyright,creation_time,location,make,"
+                                 "model";
+constexpr const char* kRiffTags = "title,artist,album,comment,copyright,date,genre,encoded_by,language,track";
+constexpr const char* kServiceTags = "title,service_name,service_provider";
+constexpr const char* kAnyTags = nullptr;
+constexpr const char* kNoTags = "";
+// QuickTime numbers these; the names are the multiplexer's.
+constexpr const char* kMovLanguages =
+    "eng,fra,ger,ita,dut,sve,spa,dan,por,nor,heb,jpn,ara,fin,gre,ice,mlt,tur,hr ,chi,urd,hin,tha,kor,lit,pol,hun,est,"
+    "lav,fo ,rus,iri,alb,ron,ces,slk,slv,yid,sr ,mac,bul,ukr,bel,uzb,kaz,aze,arm,geo,mol,kir,tgk,tuk,mon,pus,kur,kas,"
+    "snd,tib,nep,san,mar,ben,asm,guj,pa ,ori,mal,kan,tam,tel,bur,khm,lao,vie,ind,tgl,may,amh,tir,orm,som,swa,kin,run,"
+    "nya,mlg,epo,wel,baq,cat,lat,que,grn,aym,tat,uig,dzo,jav";
+constexpr int kNoFlags = 0;
+constexpr int kSenses = AV_DISPOSITION_HEARING_IMPAIRED | AV_DISPOSITION_VISUAL_IMPAIRED;
+constexpr int kMp4Flags = AV_DISPOSITION_FORCED | AV_DISPOSITION_COMMENT | AV_DISPOSITION_DUB | kSenses;
+constexpr int kMatroskaFlags = AV_DISPOSITION_FORCED | AV_DISPOSITION_COMMENT | AV_DISPOSITION_ORIGINAL | kSenses;
 constexpr const char* kMp4Subtitles = "mov_text";
 constexpr const char* kMatroskaSubtitles = "subrip,ass,ssa,text,webvtt,hdmv_pgs_subtitle,hdmv_text_subtitle,"
                                            "dvd_subtitle,dvb_subtitle";
@@ -111,38 +135,42 @@ constexpr const char* kWavSound = "pcm_s16le,pcm_s24le,pcm_s32le,pcm_f32le,pcm_f
 constexpr const char* kClusters = "cluster_time_limit=1000"; // what is lost at most when a file is cut off
 constexpr std::array kContainers{
     Container{FourCC("MP4 "), "MP4 (MPEG-4 Part 14)", "mp4,m4v", "mp4", kFragmented, nullptr,
-              kTags | kChapters | kCover | kTracks, kMp4Subtitles, kMp4Sound, false,
+              kTags | kChapters | kCover | kTracks | kLanguages | kTitles, kMp4Tags, kMp4Flags, kMp4Subtitles, kMp4Sound, false,
               {kXvid, kH264, kHevc, kMjpg, kVp9, kMpeg2, kAv1}, {kAac, kMp3, kAc3, kOpus, kVorbis}},
     Container{FourCC("MOV "), "QuickTime", "mov,qt", "mov", kFragmented, nullptr,
-              kTags | kChapters | kTracks, kMp4Subtitles, kMovSound, false,
+              kTags | kChapters | kTracks | kLanguages | kTitles, kMovTags, kNoFlags, kMp4Subtitles, kMovSound, false,
               {kXvid, kH264, kHevc, kMjpg, kMpeg2}, {kAac, kMp3, kAc3, kAlac, kPcm}},
     Container{FourCC("MKV "), "Matroska", "mkv", "matroska", kStreamed, kClusters,
-              kTags | kChapters | kCover | kFiles | kTracks, kMatroskaSubtitles, kMatroskaSound, false,
+              kTags | kChapters | kCover | kFiles | kTracks | kLanguages | kTitles, kAnyTags, kMatroskaFlags,
+              kMatroskaSubtitles, kMatroskaSound, false,
               {kXvid, kH264, kHevc, kMjpg, kVp8, kVp9, kMpeg2, kFlv1, kAv1, kFfv1},
               {kAac, kMp3, kAc3, kFlac, kOpus, kVorbis, kAlac, kMp2, kPcm}},
     Container{FourCC("AVI "), "AVI (Audio Video Interleaved)", "avi,divx", "avi", kSteadyRate, nullptr,
-              kTags | kTracks, nullptr, kAviSound, false,
+              kTags | kTracks | kTitles, kRiffTags, kNoFlags, nullptr, kAviSound, false,
               {kXvid, kH264, kMjpg, kVp8, kMpeg2, kFlv1}, {kMp3, kAac, kAc3, kPcm}},
     Container{FourCC("WEBM"), "WebM", "webm", "webm", kStreamed, kClusters,
-              kTags | kChapters | kTracks, "webvtt", "vorbis,opus", false, {kVp8, kVp9, kAv1}, {kVorbis, kOpus}},
+              kTags | kChapters | kTracks | kLanguages | kTitles, kAnyTags, AV_DISPOSITION_FORCED, "webvtt", "vorbis,opus", false,
+              {kVp8, kVp9, kAv1}, {kVorbis, kOpus}},
     Container{FourCC("FLV "), "Flash Video", "flv", "flv", kStreamed, nullptr,
-              kTags, nullptr, "aac,mp3", false, {kH264, kFlv1}, {kAac, kMp3}},
+              kTags, kAnyTags, kNoFlags, nullptr, "aac,mp3", false, {kH264, kFlv1}, {kAac, kMp3}},
     Container{FourCC("TS  "), "MPEG transport stream", "ts,m2ts,mts", "mpegts", kStreamed, nullptr,
-              kTags | kTracks, "dvb_subtitle", kTsSound, false,
+              kTags | kTracks | kLanguages, kServiceTags, kSenses, "dvb_subtitle", kTsSound, false,
               {kH264, kHevc, kXvid, kMpeg2}, {kAac, kMp3, kAc3, kOpus, kMp2}},
     Container{FourCC("MPG "), "MPEG program stream", "mpg,mpeg,vob", "vob", kStreamed, nullptr,
-              0, nullptr, "mp2,mp3,ac3,dts", false, {kMpeg2}, {kMp2, kAc3}},
-    Container{kGif, "GIF (animated)", "gif", "gif", kStreamed, nullptr, 0, nullptr, nullptr, false, {kGif}, {}},
+              0, kNoTags, kNoFlags, nullptr, "mp2,mp3,ac3,dts", false, {kMpeg2}, {kMp2, kAc3}},
+    Container{kGif, "GIF (animated)", "gif", "gif", kStreamed, nullptr, 0, kNoTags, kNoFlags, nullptr, nullptr,
+              false, {kGif}, {}},
     Container{FourCC("M4A "), "MPEG-4 audio", "m4a,m4b", "ipod", kFragmented, nullptr,
-              kTags | kChapters | kCover | kTracks, kMp4Subtitles, "aac,alac,ac3,eac3", false, {}, {kAac, kAc3, kAlac}},
+              kTags | kChapters | kCover | kTracks | kLanguages, kMp4Tags, kNoFlags, kMp4Subtitles, "aac,alac,ac3,eac3", false,
+              {}, {kAac, kAc3, kAlac}},
     Container{FourCC("MP3 "), "MP3", "mp3", "mp3", kStreamed, nullptr,
-              kTags | kCover, nullptr, "mp3", false, {}, {kMp3}},
+              kTags | kCover, kAnyTags, kNoFlags, nullptr, "mp3", false, {}, {kMp3}},
     Container{FourCC("WAV "), "WAV (RIFF wave)", "wav", "wav", kSteadyRate, "rf64=auto",
-              kTags, nullptr, kWavSound, false, {}, {kPcm, kMp3, kAc3}},
+              kTags, kRiffTags, kNoFlags, nullptr, kWavSound, false, {}, {kPcm, kMp3, kAc3}},
     Container{FourCC("FLAC"), "FLAC", "flac", "flac", kStreamed, nullptr,
-              kTags | kCover, nullptr, "flac", false, {}, {kFlac}},
+              kTags | kCover, kAnyTags, kNoFlags, nullptr, "flac", false, {}, {kFlac}},
     Container{FourCC("OGG "), "Ogg", "ogg,oga,opus", "ogg", kStreamed, nullptr,
-              kTags, nullptr, "vorbis,opus,flac,speex", true, {}, {kVorbis, kOpus, kFlac}},
+              kTags | kLanguages, kAnyTags, kNoFlags, nullptr, "vorbis,opus,flac,speex", true, {}, {kVorbis, kOpus, kFlac}},
 };
 
 constexpr std::array kFlashRates{44100, 22050, 11025, 0};
@@ -173,6 +201,20 @@ constexpr std::array kAliases{
     std::pair{FourCC("LPCM"), kPcm},  std::pair{FourCC("SOWT"), kPcm},
 };
 // clang-format on
+
+/// Whether `name` is one of those that stand in `list` between commas, in small letters.
+bool IsListed(const char* list, const std::string& name) {
+    std::string small(name);
+    std::transform(small.begin(), small.end(), small.begin(),
+                   [](unsigned char letter) { return static_cast<char>(std::tolower(letter)); });
+    const std::string_view all(list);
+    for (size_t at = all.find(small); at != std::string_view::npos; at = all.find(small, at + 1)) {
+        const size_t end = at + small.size();
+        if ((at == 0 || all[at - 1] == ',') && (end == all.size() || all[end] == ','))
+            return true;
+    }
+    return false;
+}
 
 /// The code in capitals, other names replaced by the table's.
 uint32_t Canonical(uint32_t code) {
@@ -288,6 +330,27 @@ AVCodecID PacketForm(const Container& container, AVCodecID codec) {
                              avcodec_find_decoder(codec) != nullptr &&
                              avcodec_find_encoder(usual->id) != nullptr;
     return convertible ? usual->id : AV_CODEC_ID_NONE;
+}
+
+bool CarriesTag(const Container& container, const std::string& key, const std::string& value) {
+    constexpr size_t kMost = 65535; // where lengths have 16 bits
+    const bool isShort = container.code == FourCC("MOV ") || container.code == FourCC("FLV ");
+    return (container.carries & kTags) != 0 && (container.tags == nullptr || IsListed(container.tags, key)) &&
+           (!isShort || value.size() <= kMost);
+}
+
+bool CarriesTrackTag(const Container& container, const std::string& key, const std::string& value) {
+    if (key == "title")
+        return (container.carries & kTitles) != 0;
+    if (key != "language" || (container.carries & kLanguages) == 0)
+        return false;
+    if (container.code == FourCC("MOV "))
+        return IsListed(kMovLanguages, value);
+    constexpr size_t kLetters = 3;
+    return container.tags == nullptr ||
+           (value.size() == kLetters && std::all_of(value.begin(), value.end(), [](char letter) {
+                return letter >= 'a' && letter <= 'z';
+            }));
 }
 
 const Carriage& FindCarriage(const Container& container, uint32_t codec) {

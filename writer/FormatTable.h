@@ -92,6 +92,8 @@ struct Container {
     ContainerKind kind;
     const char* options; ///< The multiplexer's own, as "name=value,...".
     uint32_t carries;    ///< kWriterFormat... of what goes in beside pictures and sound.
+    const char* tags;    ///< Keys of the texts about the movie that are written, by commas; null: any.
+    int trackFlags;      ///< AV_DISPOSITION_... that are written, beside the default one.
     /// FFmpeg's names of the codecs for subtitles that fit, that for any text first; null for none.
     const char* subtitles;
     /// FFmpeg's names of the codecs for sound whose packets fit as they are; null for none.
@@ -122,6 +124,12 @@ const AVCodec* FindEncoder(const SoundCodec& codec, int bitsPerSample);
 /// The codec as which the container carries packets of another one: the same, or for subtitles of text the
 /// one that it prefers. AV_CODEC_ID_NONE when it does not carry them.
 AVCodecID PacketForm(const Container& container, AVCodecID codec);
+
+/// Whether files hold that text about the movie.
+bool CarriesTag(const Container& container, const std::string& key, const std::string& value);
+
+/// Whether files hold that text about a track.
+bool CarriesTrackTag(const Container& container, const std::string& key, const std::string& value);
 
 /// How the container carries the codec.
 const Carriage& FindCarriage(const Container& container, uint32_t codec);

@@ -199,6 +199,27 @@ int MWSetTag(uint32_t set, const char* key, const char* value) {
     return ChangeExtras(set, [&](Extras& extras) { return writer::SetTag(extras.tags, key, value); });
 }
 
+int MWCarriesTag(uint32_t format, const char* key, const char* value) {
+    return Guarded(0, [&] {
+        const writer::Container* container = writer::FindContainer(format);
+        const bool isTold = key != nullptr && value != nullptr;
+        return container != nullptr && isTold && writer::CarriesTag(*container, key, value) ? 1 : 0;
+    });
+}
+
+int MWCarriesTrackTag(uint32_t format, const char* key, const char* value) {
+    return Guarded(0, [&] {
+        const writer::Container* container = writer::FindContainer(format);
+        const bool isTold = key != nullptr && value != nullptr;
+        return container != nullptr && isTold && writer::CarriesTrackTag(*container, key, value) ? 1 : 0;
+    });
+}
+
+int MWCarriedTrackFlags(uint32_t format) {
+    const writer::Container* container = writer::FindContainer(format);
+    return container != nullptr ? container->trackFlags : 0;
+}
+
 int MWSetTrackTag(uint32_t set, int track, const char* key, const char* value) {
     return ChangeExtras(set, [&](Extras& extras) {
         writer::TrackLabel* label = writer::FindLabel(extras, track);

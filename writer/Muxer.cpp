@@ -1,11 +1,13 @@
 #include "writer/Muxer.h"
 
+#include "media/FourCC.h"
 #include "media/MediaRecords.h"
 #include "thread/Stall.h"
 #include "writer/WriterFailure.h"
 #include "writer/WriterStatus.h"
 
 extern "C" {
+#include <libavutil/avstring.h>
 #include <libavutil/opt.h>
 }
 
@@ -34,6 +36,12 @@ bool HasPictures(const AVFormatContext& output) {
     });
 }
 
+/// Whether a packet only says that no text is shown, as the multiplexer writes some itself.
+bool IsEmptyText(const AVPacket& packet, const AVStream& stream) {
+    constexpr int kNoLetters = 2; // the length of a text
+    return stream.codecpar->codec_id == AV_CODEC_ID_MOV_TEXT && packet.size <= kNoLetters;
+}
+
 /// Whether a packet of sound holds little but its codec's run-up. Where time is a count from 0 on, such a
 /// packet would be heard and move all sound away from the pictures.
 bool IsRunUp(const AVPacket& packet, const AVStream& stream) {
@@ -47,6 +55,28 @@ void SetOption(AVFormatContext& output, const char* name, const std::string& val
 void SetTags(AVDictionary*& metadata, const Tags& tags) {
     for (const auto& [key, value] : tags)
         av::CheckMemory(av_dict_set(&metadata, key.c_str(), value.c_str(), 0));
+}
+
+/// What the container can hold. Vorbis comments have one name for both the comment and the description: what
+/// would be lost goes into one text.
+Tags TagsFor(const Container& container, Tags tags) {
+    constexpr uint32_t kFlac = FourCC("FLAC");
+    constexpr uint32_t kOgg = FourCC("OGG ");
+    for (auto tag = tags.begin(); tag != tags.end();)
+        tag = CarriesTag(container, tag->first, tag->second) ? std::next(tag) : tags.erase(tag);
+    const auto find = [&](const char* key) {
+        return std::find_if(tags.begin(), tags.end(),
+                            [&](const auto& tag) { return av_strcasecmp(tag.first.c_str(), key) == 0; });
+    };
+    const auto comment = find("comment");
+    const auto description = find("description");
+    if ((container.code != kFlac && container.code != kOgg) || comment == tags.end() ||
+        description == tags.end())
+        return tags;
+    if (comment->second != description->second)
+        description->second += "\n" + comment->second;
+    tags.erase(comment);
+    return tags;
 }
 
 void SetFragments(AVFormatContext& output, bool describedByPacket, int64_t room) {
@@ -79,7 +109,7 @@ Muxer::Muxer(const Container& container, AvioFile& file, bool fragmented, bool b
     if (bitExact)
         output_->flags |= AVFMT_FLAG_BITEXACT;
     if (Carries(kWriterFormatTags))
-        SetTags(output_->metadata, extras.tags);
+        SetTags(output_->metadata, TagsFor(container, extras.tags));
 }
 
 int Muxer::AddStream(const MuxedStream& stream) {
@@ -90,7 +120,7 @@ int Muxer::AddStream(const MuxedStream& stream) {
     if (Carries(kWriterFormatTags)) {
         SetTags(made->metadata, stream.label->tags);
         if (container_.tagsInStream)
-            SetTags(made->metadata, extras_.tags);
+            SetTags(made->metadata, TagsFor(container_, extras_.tags));
     }
     made->disposition = stream.label->flags;
     made->codecpar->codec_tag = stream.carriage->tag;
@@ -166,6 +196,7 @@ void Muxer::AddCover() {
     made->codecpar->width = extras_.cover.width;
     made->codecpar->height = extras_.cover.height;
     made->disposition = AV_DISPOSITION_ATTACHED_PIC;
+    SetTags(made->metadata, {{"comment", "Cover (front)"}}); // what kind of picture it is
     made->time_base = {1, 90000};
     coverStream_ = made->index;
 }
@@ -247,12 +278,13 @@ void Muxer::Write(AVPacket& packet, int stream) {
     const int64_t time = av_rescale_q(packet_->dts, out->time_base, av_get_time_base_q());
     output_->max_interleave_delta = MostApart(packet_->size);
     // A cover never gets a second packet, for which the multiplexer would wait.
+    const int counted = IsEmptyText(*packet_, *out) ? 0 : 1;
     const bool alone = coverStream_ >= 0 && streams_.size() == 1;
     Check(alone ? av_write_frame(output_.get(), packet_.get())
                 : av_interleaved_write_frame(output_.get(), packet_.get()),
           "refuses a packet");
     av_packet_unref(packet_.get());
-    ++state.packets;
+    state.packets += counted;
     NoteWhole();
     FlushNowAndThen(time);
 }

@@ -50,10 +50,12 @@ public:
 protected:
     /// `packet` at its time in the file, in 100 ns units.
     void HandOn(AVPacket& packet, int64_t begin, int64_t duration) {
-        packet.pts = packet.dts = av_rescale_q(begin, kTick, unit_);
-        packet.duration = av_rescale_q(begin + duration, kTick, unit_) - packet.pts;
-        packet.flags |= AV_PKT_FLAG_KEY;
-        HandOn(packet);
+        // The multiplexer ends a text only when other streams come in between, which they do not at the
+        // close.
+        if (parameters_->codec_id == AV_CODEC_ID_MOV_TEXT && end_ && *end_ < begin)
+            HandOnEmpty(*end_, begin);
+        end_ = begin + duration;
+        Send(packet, begin, duration);
     }
     void HandOn(AVPacket& packet) { take_(packet); }
 
@@ -62,7 +64,23 @@ protected:
     av::CodecParameters parameters_;
 
 private:
+    void HandOnEmpty(int64_t begin, int64_t end) {
+        constexpr int kNoLetters = 2; // the length of a text
+        const av::Packet packet = av::NewPacket();
+        av::CheckMemory(av_new_packet(packet.get(), kNoLetters));
+        std::fill_n(packet->data, kNoLetters, uint8_t{0});
+        Send(*packet, begin, end - begin);
+    }
+
+    void Send(AVPacket& packet, int64_t begin, int64_t duration) {
+        packet.pts = packet.dts = av_rescale_q(begin, kTick, unit_);
+        packet.duration = av_rescale_q(begin + duration, kTick, unit_) - packet.pts;
+        packet.flags |= AV_PKT_FLAG_KEY;
+        HandOn(packet);
+    }
+
     PacketTaker take_;
+    std::optional<int64_t> end_; // of the packet before
 };
 
 /// Subtitles as they are.

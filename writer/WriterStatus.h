@@ -209,7 +209,9 @@ enum {
     kWriterFormatChapters = 4,     ///< Carries chapters.
     kWriterFormatCover = 8,        ///< Carries a cover picture.
     kWriterFormatAttachments = 16, ///< Carries attached files, such as fonts.
-    kWriterFormatTracks = 32       ///< Carries several tracks of sound.
+    kWriterFormatTracks = 32,      ///< Carries several tracks of sound.
+    kWriterFormatLanguages = 64,   ///< Carries the languages of tracks.
+    kWriterFormatTrackTitles = 128 ///< Carries the titles of tracks.
 };
 
 /// kWriterFormat... of the format with that code, together; 0 for one that is not in the table.
@@ -251,14 +253,25 @@ enum { kWriterSourceTimeTag = 0x4D495453 };
 /// "creation_time" (ISO 8601), or as the format has it. Null or an empty value takes the text away.
 int MWSetTag(uint32_t set, const char* key, const char* value);
 
+/// 1 when files of the format hold that text, which they may not for its key or its length; else 0.
+int MWCarriesTag(uint32_t format, const char* key, const char* value);
+
 /// Numbers of tracks: the engine's pictures, its sound, and from there on those that are added.
 enum { kWriterTrackPictures = 0, kWriterTrackSound = 1, kWriterTrackFurther = 2 };
 
 /// The same about a track, such as "language" (ISO 639-2) or "title".
 int MWSetTrackTag(uint32_t set, int track, const char* key, const char* value);
 
+/// 1 when files of the format hold that text about a track: a format can have names of its own for some
+/// languages, and none for others. Else 0.
+int MWCarriesTrackTag(uint32_t format, const char* key, const char* value);
+
 /// What a track is for: FFmpeg's AV_DISPOSITION_..., together.
 int MWSetTrackFlags(uint32_t set, int track, int flags);
+
+/// Those of these flags that files of the format hold, beside AV_DISPOSITION_DEFAULT; 0 without such a
+/// format.
+int MWCarriedTrackFlags(uint32_t format);
 
 struct AVCodecParameters;
 struct AVPacket;

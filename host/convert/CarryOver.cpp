@@ -25,6 +25,8 @@ namespace {
 
 constexpr std::string_view kChapterTrack = "bin_data"; // MP4 holds the chapters once more, as texts
 
+constexpr int64_t kLargestCoverInFlac = 16'000'000; // with its description below 2^24
+
 int64_t Ticks(double seconds) {
     return std::llround(seconds * kTicksPerSecond);
 }
@@ -43,11 +45,44 @@ int Dispositions(const StreamFlags& flags) {
            (flags.visualImpaired ? AV_DISPOSITION_VISUAL_IMPAIRED : 0);
 }
 
-void LabelTrack(const StreamInfo& stream, const Request& request, uint32_t set, int track) {
-    MWSetTrackTag(set, track, "language", stream.language.c_str());
-    if (!request.noMetadata)
+/// "a", "a and b", "a, b and c".
+std::string Enumerate(const std::vector<std::string>& names) {
+    std::string text;
+    for (std::size_t i = 0; i < names.size(); ++i)
+        text += (i == 0 ? "" : i + 1 == names.size() ? " and " : ", ") + names[i];
+    return text;
+}
+
+/// Says what a track is, as far as the format can. Returns what it cannot.
+std::optional<NotCarried> LabelTrack(const StreamInfo& stream, const Request& request,
+                                     const FileFormatInfo& format, uint32_t set, int track) {
+    std::vector<std::string> missing;
+    const auto carries = [&](const char* key, const std::string& value) {
+        return MWCarriesTrackTag(format.fccFormat, key, value.c_str()) != 0;
+    };
+    if (!stream.language.empty()) {
+        const std::vector<std::string> codes = CodesFor(stream.language);
+        const auto code = std::find_if(codes.begin(), codes.end(),
+                                       [&](const std::string& each) { return carries("language", each); });
+        if (code != codes.end())
+            MWSetTrackTag(set, track, "language", code->c_str());
+        else
+            missing.emplace_back("language");
+    }
+    if (!request.noMetadata && !stream.title.empty()) {
         MWSetTrackTag(set, track, "title", stream.title.c_str());
-    MWSetTrackFlags(set, track, Dispositions(stream.flags));
+        if (!carries("title", stream.title))
+            missing.emplace_back("title");
+    }
+    const int flags = Dispositions(stream.flags);
+    MWSetTrackFlags(set, track, flags);
+    if ((flags & ~(MWCarriedTrackFlags(format.fccFormat) | AV_DISPOSITION_DEFAULT)) != 0)
+        missing.emplace_back("flags");
+    if (missing.empty())
+        return std::nullopt;
+    return NotCarried{"label", stream.index >= 0 ? std::optional(stream.index) : std::nullopt, stream.codec,
+                      stream.language,
+                      fmt::format("{} cannot hold its {}", NameOf(format), Enumerate(missing))};
 }
 
 const StreamInfo& StreamAt(const SourceInfo& source, int index) {
@@ -63,19 +98,45 @@ bool IsAmong(const std::vector<int>& list, int number) {
     return std::count(list.begin(), list.end(), number) > 0;
 }
 
-void CarryTexts(const SourceInfo& source, const Request& request, uint32_t set) {
+/// The texts of the output: the source's, where the request has no others.
+std::vector<Tag> TextsFor(const SourceInfo& source, const Request& request) {
+    std::vector<Tag> texts;
     for (const Tag& tag : source.tags) {
         const bool replaced = std::any_of(request.metadata.begin(), request.metadata.end(),
                                           [&](const Tag& wish) { return AreAlike(wish.key, tag.key); });
         if (!request.noMetadata && !replaced)
-            MWSetTag(set, tag.key.c_str(), tag.value.c_str());
+            texts.push_back(tag);
     }
-    for (const Tag& tag : request.metadata)
+    texts.insert(texts.end(), request.metadata.begin(), request.metadata.end());
+    return texts;
+}
+
+/// Returns what the format cannot hold.
+std::vector<NotCarried> CarryTexts(const SourceInfo& source, const Request& request,
+                                   const FileFormatInfo& format, uint32_t set) {
+    std::vector<NotCarried> left;
+    std::vector<std::string> missing;
+    for (const Tag& tag : TextsFor(source, request)) {
         MWSetTag(set, tag.key.c_str(), tag.value.c_str());
-    if (source.pictures)
-        LabelTrack(StreamAt(source, source.pictures->index), request, set, kWriterTrackPictures);
-    if (source.sound)
-        LabelTrack(StreamAt(source, source.sound->index), request, set, kWriterTrackSound);
+        if (!tag.value.empty() && MWCarriesTag(format.fccFormat, tag.key.c_str(), tag.value.c_str()) == 0)
+            missing.push_back(tag.key);
+    }
+    if (!missing.empty())
+        left.push_back({"tags",
+                        std::nullopt,
+                        {},
+                        {},
+                        fmt::format("{} cannot hold {}", NameOf(format), Enumerate(missing))});
+    const auto label = [&](int stream, int track) {
+        if (std::optional<NotCarried> lost =
+                LabelTrack(StreamAt(source, stream), request, format, set, track))
+            left.push_back(std::move(*lost));
+    };
+    if (source.pictures && !request.noVideo && format.bHasVideo != 0)
+        label(source.pictures->index, kWriterTrackPictures);
+    if (source.sound && !request.noAudio && !request.copySound && format.bHasAudio != 0)
+        label(source.sound->index, kWriterTrackSound);
+    return left;
 }
 
 int TakeNext(void* context, int64_t until, int closing, WriterTrackItem* item) {
@@ -162,9 +223,13 @@ public:
             each.track.pContext = each.source;
             if (MWAddTrack(set_, &each.track) == 0)
                 throw std::bad_alloc();
-            LabelTrack(each.stream, request_, set_, number++);
+            if (std::optional<NotCarried> lost = LabelTrack(each.stream, request_, format_, set_, number++))
+                lost_.push_back(std::move(*lost));
         }
     }
+
+    /// What the format cannot say of those that were added.
+    const std::vector<NotCarried>& Lost() const { return lost_; }
 
 private:
     struct Track {
@@ -179,6 +244,7 @@ private:
     const FileFormatInfo& format_;
     const uint32_t set_;
     std::vector<Track> tracks_;
+    std::vector<NotCarried> lost_;
 };
 
 bool BelongTogether(const StreamInfo& one, const StreamInfo& other) {
@@ -280,7 +346,11 @@ std::string WhyItStays(const SourceInfo& source, const Chosen& chosen, const Str
         return stream.codec == kChapterTrack && !source.chapters.empty() ? ""
                                                                          : "data streams are not converted";
     case StreamKind::kCover:
-        return (traits & kWriterFormatCover) != 0 ? "" : fmt::format("{} cannot hold it", NameOf(format));
+        if ((traits & kWriterFormatCover) == 0)
+            return fmt::format("{} cannot hold it", NameOf(format));
+        return format.fccFormat == FourCC("FLAC") && stream.bytes > kLargestCoverInFlac
+                   ? fmt::format("{} cannot hold one of {} bytes", NameOf(format), stream.bytes)
+                   : "";
     case StreamKind::kAttachment:
         return (traits & kWriterFormatAttachments) != 0 ? ""
                                                         : fmt::format("{} cannot hold it", NameOf(format));
@@ -323,10 +393,21 @@ NotCarried LeftOf(const StreamInfo& stream, std::string reason) {
             std::move(reason)};
 }
 
+/// Without what is drawn into the pictures, unless it is asked for by name.
+std::vector<int> SubtitlesToCarry(const SourceInfo& source, const Request& request) {
+    std::vector<int> wanted = WantedTracks(source.streams, StreamKind::kSubtitles, request.subtitles);
+    if (!request.subtitles)
+        wanted.erase(
+            std::remove_if(wanted.begin(), wanted.end(),
+                           [&](int stream) { return std::to_string(stream) == request.burnSubtitles; }),
+            wanted.end());
+    return wanted;
+}
+
 Chosen ChosenOf(const SourceInfo& source, const Request& request) {
     return {source.pictures ? source.pictures->index : -1, source.sound ? source.sound->index : -1,
             WantedTracks(source.streams, StreamKind::kSound, request.audioTracks),
-            WantedTracks(source.streams, StreamKind::kSubtitles, request.subtitles)};
+            SubtitlesToCarry(source, request)};
 }
 
 } // namespace
@@ -346,8 +427,7 @@ std::vector<int> FurtherSound(const SourceInfo& source, const Request& request,
 std::vector<NotCarried> CarryOver(Movie& movie, const Request& request, const FileFormatInfo& format,
                                   uint32_t writerSet) {
     const SourceInfo& source = movie.Info();
-    std::vector<NotCarried> left;
-    CarryTexts(source, request, writerSet);
+    std::vector<NotCarried> left = CarryTexts(source, request, format, writerSet);
     if (std::optional<NotCarried> chapters = WhyChaptersStay(source, request, format))
         left.push_back(*std::move(chapters));
     else if (!request.noChapters)
@@ -369,6 +449,7 @@ std::vector<NotCarried> CarryOver(Movie& movie, const Request& request, const Fi
         if (std::optional<NotCarried> stays = tracks.AddFile(wish, request.subtitleCharset))
             left.push_back(std::move(*stays));
     tracks.Finish();
+    left.insert(left.end(), tracks.Lost().begin(), tracks.Lost().end());
     bool hasCover = false;
     for (const StreamInfo& stream : source.streams) {
         if (!chosen.Wants(stream))

@@ -78,9 +78,10 @@ struct Warning {
 
 /// Something of the source that its output does not hold, although the conversion goes well.
 struct NotCarried {
-    /// "pictures", "sound", "subtitles", "chapters", "cover", "attachment" or "data".
+    /// "pictures", "sound", "subtitles", "chapters", "cover", "attachment", "data", "tags" or, of a track
+    /// that is carried, "label".
     std::string kind;
-    std::optional<int> number; ///< Of the stream in the source; nothing for chapters.
+    std::optional<int> number; ///< Of the stream in the source; nothing for chapters and tags.
     std::string codec;
     std::string language; ///< Empty when it is not known.
     std::string reason;   ///< A clause.

@@ -86,6 +86,9 @@ struct Request {
     TrackList subtitles;
     std::vector<SubtitleFileWish> subtitleFiles; ///< Further subtitles of text.
     std::string subtitleCharset;                 ///< Of these files; empty: each is looked at.
+    /// Subtitles drawn into the pictures: a number as SourceInfo has it, or a file, in subtitleCharset. A
+    /// stream that is drawn is not carried unless `subtitles` asks for it.
+    std::string burnSubtitles;
     bool noChapters = false;
     bool noMetadata = false;   ///< None of the source's texts, but the languages of tracks.
     std::vector<Tag> metadata; ///< Texts that replace the source's; an empty value takes one away.

@@ -4,6 +4,7 @@
 #include "host/convert/EncodePlan.h"
 #include "host/convert/Failure.h"
 #include "host/source/CropDetection.h"
+#include "host/source/MediaTime.h"
 
 #include <utility>
 
@@ -33,6 +34,20 @@ SourceChoice CroppedChoiceOf(const Request& request, const std::shared_ptr<Inter
     return choice;
 }
 
+/// Throws Failure when there are no pictures to draw them into.
+BurnWish BurnOf(const Request& request) {
+    if (request.noVideo || ChooseFormat(request).bHasVideo == 0)
+        throw Failure(Category::kRequest, "there are no pictures in the output to draw subtitles into");
+    BurnWish wish{request.burnSubtitles, request.subtitleCharset, ToMediaTime(request.begin)};
+    if (request.length)
+        wish.end = ToMediaTime(request.begin + *request.length);
+    if (request.piece) {
+        wish.begin = request.piece->begin;
+        wish.end = request.piece->end;
+    }
+    return wish;
+}
+
 /// With the pictures as the output takes them.
 SourceChoice ChoiceForOutput(const Request& request, const std::shared_ptr<Interruption>& interruption) {
     SourceChoice choice = CroppedChoiceOf(request, interruption);
@@ -40,6 +55,8 @@ SourceChoice ChoiceForOutput(const Request& request, const std::shared_ptr<Inter
         return choice;
     choice.deep = MostDepth(request, ChooseFormat(request)) > 8;
     choice.keepHdr = choice.deep && request.hdr != Hdr::kSdr;
+    if (!request.burnSubtitles.empty())
+        choice.burn = BurnOf(request);
     return choice;
 }
 

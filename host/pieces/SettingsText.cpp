@@ -223,6 +223,7 @@ void Asked(Archive& archive, Fields& request) {
     archive("subtitles", request.subtitles);
     archive("subtitleFiles", request.subtitleFiles);
     archive("subtitleCharset", request.subtitleCharset);
+    archive("burnSubtitles", request.burnSubtitles);
     archive("noChapters", request.noChapters);
     archive("noMetadata", request.noMetadata);
     archive("metadata", request.metadata);

@@ -8,6 +8,8 @@ namespace movieconv {
 namespace {
 
 constexpr int kSilenceBlocksPerSecond = 10;
+constexpr int64_t kLongest =
+    24 * 60 * 60; // seconds that a packet lasts; some multiplexers write 2^32 ms for "open"
 
 } // namespace
 
@@ -164,7 +166,8 @@ void BesidePackets::Hold(av::Packet packet) {
     const int64_t stamp = held.packet->pts != AV_NOPTS_VALUE ? held.packet->pts : held.packet->dts;
     if (stamp != AV_NOPTS_VALUE) {
         held.begin = clock_(stamp, timeBase_);
-        held.end = clock_(stamp + std::max<int64_t>(held.packet->duration, 0), timeBase_);
+        const bool isLasting = av_rescale_q(held.packet->duration, timeBase_, {1, 1}) >= kLongest;
+        held.end = clock_(stamp + (isLasting ? 0 : std::max<int64_t>(held.packet->duration, 0)), timeBase_);
     }
     latest_ = std::max(latest_, held.begin);
     if (held.Ends() && held.end <= fileBegin_)

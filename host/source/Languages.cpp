@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <cctype>
+#include <utility>
 
 namespace movieconv {
 namespace {
@@ -36,6 +37,17 @@ constexpr Language kLanguages[] = {
 };
 // clang-format on
 
+// Where QuickTime's name, as FFmpeg has it, is neither of these.
+constexpr std::pair<std::string_view, std::string_view> kQuickTimeNames[] = {
+    {"fao", "fo "}, {"gle", "iri"}, {"hrv", "hr "}, {"nno", "nor"},
+    {"nob", "nor"}, {"pan", "pa "}, {"srp", "sr "}, {"swe", "sve"},
+};
+
+bool HasThreeLetters(std::string_view code) {
+    return code.size() == 3 &&
+           std::all_of(code.begin(), code.end(), [](char letter) { return letter >= 'a' && letter <= 'z'; });
+}
+
 std::string Small(std::string_view code) {
     std::string small(code);
     std::transform(small.begin(), small.end(), small.begin(),
@@ -57,13 +69,34 @@ const Language* Find(const std::string& small) {
 
 std::string ThreeLetters(std::string_view code) {
     const std::string small = Small(code);
+    for (const auto& [three, name] : kQuickTimeNames)
+        if (small == name && name != "nor")
+            return std::string(three);
     const Language* language = Find(small);
     return language != nullptr ? std::string(language->three) : small;
 }
 
 std::string LanguageName(std::string_view code) {
-    const Language* language = Find(Small(code));
+    const Language* language = Find(ThreeLetters(code));
     return std::string(language != nullptr ? language->name : code);
+}
+
+std::vector<std::string> CodesFor(std::string_view code) {
+    const std::string three = ThreeLetters(code);
+    std::vector<std::string> codes;
+    const auto add = [&](std::string_view name) {
+        if (!name.empty() && std::find(codes.begin(), codes.end(), name) == codes.end())
+            codes.emplace_back(name);
+    };
+    if (HasThreeLetters(code) && Find(std::string(code)) != nullptr)
+        add(code);
+    add(three);
+    if (const Language* found = Find(three))
+        add(found->other);
+    for (const auto& [own, name] : kQuickTimeNames)
+        if (three == own)
+            add(name);
+    return codes;
 }
 
 } // namespace movieconv

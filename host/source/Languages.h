@@ -4,6 +4,7 @@
 
 #include <string>
 #include <string_view>
+#include <vector>
 
 namespace movieconv {
 
@@ -13,6 +14,10 @@ std::string ThreeLetters(std::string_view code);
 
 /// The English name of the language, "French"; of one that is not known the code as it is.
 std::string LanguageName(std::string_view code);
+
+/// The codes under which containers may know the language, the nearest to `code` first: itself where it is
+/// one of three letters, those of ISO 639-2, QuickTime's own.
+std::vector<std::string> CodesFor(std::string_view code);
 
 } // namespace movieconv
 

@@ -2,15 +2,28 @@
 
 #include "host/source/EarlierCues.h"
 #include "host/source/MediaTime.h"
+#include "host/source/SourceError.h"
 
 #include <fmt/format.h>
 #include <utility>
 
 namespace movieconv {
+namespace {
+
+std::unique_ptr<SubtitleBurner> MakeBurner(const Source& source, const SourceChoice& choice) {
+    if (!choice.burn || choice.stampsOnly)
+        return nullptr;
+    if (source.PictureStream() == nullptr)
+        throw TrackError("there are no pictures to draw subtitles into");
+    return std::make_unique<SubtitleBurner>(source, choice);
+}
+
+} // namespace
 
 Movie::Movie(const std::string& path, const SourceChoice& choice, std::shared_ptr<Interruption> interruption)
     : choice_(choice),
       source_(path, choice, std::move(interruption)),
+      burner_(MakeBurner(source_, choice)),
       failures_([this] { demuxer_.Stop(); }),
       demuxer_(source_, failures_) {
     if (choice.fromStart)
@@ -18,7 +31,7 @@ Movie::Movie(const std::string& path, const SourceChoice& choice, std::shared_pt
     if (source_.PictureStream() != nullptr && choice.stampsOnly)
         stamps_ = std::make_unique<PictureStamps>(source_, demuxer_);
     else if (source_.PictureStream() != nullptr)
-        pictures_ = std::make_unique<PictureDecoder>(source_, demuxer_, failures_, choice);
+        pictures_ = std::make_unique<PictureDecoder>(source_, demuxer_, failures_, choice, burner_.get());
     if (source_.SoundStream() != nullptr)
         sound_ = std::make_unique<SoundDecoder>(source_, demuxer_, failures_);
 }

@@ -10,6 +10,7 @@
 #include "host/source/PictureStamps.h"
 #include "host/source/SoundDecoder.h"
 #include "host/source/Source.h"
+#include "host/source/SubtitleBurner.h"
 #include "host/source/SubtitleFile.h"
 
 #include <map>
@@ -105,6 +106,7 @@ private:
 
     const SourceChoice choice_;
     Source source_;
+    std::unique_ptr<SubtitleBurner> burner_; // where subtitles are to be seen in the pictures
     Failures failures_;
     Demuxer demuxer_;
     std::unique_ptr<PictureDecoder> pictures_;

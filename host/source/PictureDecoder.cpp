@@ -29,7 +29,7 @@ double BitsPerPixel(const Source& source) {
 } // namespace
 
 PictureDecoder::PictureDecoder(const Source& source, Demuxer& demuxer, Failures& failures,
-                               const SourceChoice& choice)
+                               const SourceChoice& choice, SubtitleBurner* burner)
     : reader_(source.Reader()),
       demuxer_(demuxer),
       failures_(failures),
@@ -40,6 +40,7 @@ PictureDecoder::PictureDecoder(const Source& source, Demuxer& demuxer, Failures&
       decoder_(std::make_unique<StreamDecoder>(*parameters_, timeBase_, threads_.Count())),
       filter_(*source.Info().pictures, choice),
       converter_(*source.Info().pictures, choice.deep && source.Info().pictures->depth > 8),
+      burner_(burner),
       stamps_(ToMediaTime(1 / source.Info().pictures->frameRate)),
       queue_(threads_.OnTrial() ? kPicturesAhead : kHeavyPicturesAhead, kBytesAhead,
              {L"Movie::The picture decoder waits for the conversion",
@@ -188,6 +189,8 @@ bool PictureDecoder::Deliver(StampRepair::Stamp stamp) {
         ++damagedBefore_;
         return true;
     }
+    if (burner_ != nullptr)
+        burner_->Draw(*picture, stamp.time);
     first_ = false;
     threads_.OnPicture(queue_.Size() == 0);
     const std::size_t bytes = Bytes(*picture);

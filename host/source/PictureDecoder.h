@@ -13,6 +13,7 @@
 #include "host/source/PictureFilter.h"
 #include "host/source/StampRepair.h"
 #include "host/source/StreamDecoder.h"
+#include "host/source/SubtitleBurner.h"
 #include "media/Decoders.h"
 #include "thread/BoundedQueue.h"
 
@@ -28,7 +29,9 @@ class PictureDecoder final : public VideoDecoder {
 public:
     /// The first picture handed out is the one shown at the time that Seek asked for, stamped with that time;
     /// without Seek it is the movie's first, stamped with 0 if it comes later. Throws SourceError.
-    PictureDecoder(const Source& source, Demuxer& demuxer, Failures& failures, const SourceChoice& choice);
+    /// `burner`, where there is one, draws into the pictures and has to last as long.
+    PictureDecoder(const Source& source, Demuxer& demuxer, Failures& failures, const SourceChoice& choice,
+                   SubtitleBurner* burner = nullptr);
     ~PictureDecoder();
 
     VideoSourceInfo* GetVideoInfo() override { return &info_; }
@@ -84,6 +87,7 @@ private:
     std::unique_ptr<StreamDecoder> decoder_;
     PictureFilter filter_;
     PictureConverter converter_;
+    SubtitleBurner* const burner_;
     StampRepair stamps_;
     av::Frame held_; // decoded, its stamp not settled yet
     std::optional<int64_t> begin_;

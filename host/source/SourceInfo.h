@@ -2,6 +2,7 @@
 #ifndef MOVIECONV_HOST_SOURCE_SOURCEINFO_H
 #define MOVIECONV_HOST_SOURCE_SOURCEINFO_H
 
+#include "host/source/BurnWish.h"
 #include "host/source/Completeness.h"
 #include "host/source/Crop.h"
 #include "host/source/Deinterlace.h"
@@ -149,6 +150,7 @@ struct SourceChoice {
     TrackList soundTracks{};
     TrackList subtitles{};
     Deinterlace deinterlace = Deinterlace::kFlagged;
+    std::optional<BurnWish> burn{};
     bool deep = false;       ///< Pictures of more than 8 bits are handed out with 10; otherwise with 8.
     Crop crop{};             ///< Cut off the pictures; odd numbers are lowered by one.
     bool keepHdr = false;    ///< HDR pictures are handed out as they are; otherwise as BT.709.

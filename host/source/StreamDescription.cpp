@@ -1,6 +1,7 @@
 #include "host/source/StreamDescription.h"
 
 #include "host/source/MediaTime.h"
+#include "host/source/SubtitleFile.h"
 
 #include <algorithm>
 #include <array>
@@ -30,9 +31,10 @@ bool IsNote(const std::string& key) {
            std::any_of(kStatistics.begin(), kStatistics.end(), begins);
 }
 
+/// Old files have texts in the character set of their time; no container of today takes these.
 std::string TagOf(const AVDictionary* metadata, const char* key) {
     const AVDictionaryEntry* entry = av_dict_get(metadata, key, nullptr, 0);
-    return entry != nullptr ? entry->value : "";
+    return entry != nullptr ? ToUtf8(entry->value, "") : "";
 }
 
 std::vector<Tag> TagsWithout(const AVDictionary* metadata, std::string_view left) {
@@ -275,7 +277,7 @@ std::vector<Tag> DescribeTags(const AVDictionary* metadata) {
     const AVDictionaryEntry* entry = nullptr;
     while ((entry = av_dict_get(metadata, "", entry, AV_DICT_IGNORE_SUFFIX)) != nullptr)
         if (!IsNote(entry->key))
-            tags.push_back({entry->key, entry->value});
+            tags.push_back({ToUtf8(entry->key, ""), ToUtf8(entry->value, "")});
     return tags;
 }
 

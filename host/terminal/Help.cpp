@@ -67,11 +67,12 @@ std::vector<std::string> SplitAt(const std::string& text, char separator) {
 
 void DescribeValue(const CLI::Option& option, OptionEntry& entry) {
     const std::string type = option.get_type_name();
+    const bool isFile = type.find("FILE") != std::string::npos; // alone, "N|FILE" or "FILE[:LANG]"
     entry.value = option.get_items_expected_max() == 0 ? OptionEntry::Value::kNone
-                  : type == "FILE"                     ? OptionEntry::Value::kFile
+                  : isFile                             ? OptionEntry::Value::kFile
                   : type == "PRESET"                   ? OptionEntry::Value::kPreset
                                                        : OptionEntry::Value::kFree;
-    if (type.find('|') != std::string::npos)
+    if (type.find('|') != std::string::npos && !isFile)
         entry.choices = SplitAt(type, '|');
     else if (entry.longName == "format")
         entry.choices = ExtensionNames();

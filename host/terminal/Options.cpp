@@ -237,8 +237,12 @@ void AddCarried(CLI::App& app, Options& options) {
         ->allow_extra_args(false) // another value needs the option again: INPUT may follow
         ->take_all()
         ->group(group);
+    app.add_option("--burn-subtitles", request.burnSubtitles,
+                   "Draw subtitles into the pictures: those with a number\nas --info shows it, or a file's")
+        ->type_name("N|FILE")
+        ->group(group);
     app.add_option("--subtitle-charset", request.subtitleCharset,
-                   "Character set of these files, where it is not UTF-8,\nUTF-16 or Windows-1252")
+                   "Character set of files of subtitles, if not UTF-8,\nUTF-16 or Windows-1252")
         ->type_name("NAME")
         ->group(group);
     app.add_flag("--no-chapters", request.noChapters, "Leave chapters out")->group(group);

@@ -1,0 +1,109 @@
+#include "host/source/CueList.h"
+
+#include "host/source/MediaTime.h"
+#include "host/source/SourceError.h"
+#include "host/source/StreamChoice.h"
+#include "host/source/StreamDecoder.h"
+#include "host/source/SubtitleFile.h"
+
+#include <algorithm>
+#include <fmt/format.h>
+#include <memory>
+#include <utility>
+
+namespace movieconv {
+namespace {
+
+constexpr int64_t kFarthest = 60 * kTicksPerSecond; // before the begin, of what may last into it
+constexpr int64_t kLongestCue = 24LL * 60 * 60 * kTicksPerSecond;
+
+void CheckDecodable(const AVCodecParameters& parameters, const BurnWish& wish) {
+    if (avcodec_find_decoder(parameters.codec_id) == nullptr)
+        throw TrackError(fmt::format("the subtitles \"{}\" cannot be decoded", wish.what));
+}
+
+void Add(CueList& list, av::Packet packet, int64_t begin, int64_t duration) {
+    const bool isKnown = duration > 0 && duration < kLongestCue;
+    list.cues.push_back({begin, isKnown ? begin + duration : begin, std::move(packet)});
+}
+
+void ReadStream(CueList& list, const Source& source, const BurnWish& wish, bool playlists) {
+    const int stream = WantedTracks(source.Info().streams, StreamKind::kSubtitles, {{wish.what}}).front();
+    MovieReader reader(source.Info().path, playlists, std::make_shared<Interruption>());
+    if (!reader.IsSeekable())
+        throw TrackError("the subtitles of a pipe cannot be drawn into its pictures");
+    AVFormatContext* context = reader.Context();
+    if (stream >= static_cast<int>(context->nb_streams))
+        throw TrackError(fmt::format("the subtitles {} are not there any more", stream));
+    const AVStream& found = *context->streams[stream];
+    CheckDecodable(*found.codecpar, wish);
+    list.parameters = CopyOf(*found.codecpar);
+    reader.Select({stream});
+    if (wish.begin > kFarthest) {
+        const int64_t from = reader.Start() + wish.begin - kFarthest;
+        const int64_t target = av_rescale_q(from, {1, kTicksPerSecond}, av_get_time_base_q());
+        if (avformat_seek_file(context, -1, INT64_MIN, target, target, 0) < 0 && !reader.Rewind())
+            throw TrackError("the subtitles cannot be read ahead of the pictures");
+    }
+    for (;;) {
+        av::Packet packet = av::NewPacket();
+        const int result = av_read_frame(context, packet.get());
+        av::CheckMemory(result);
+        const int64_t stamp = packet->pts != AV_NOPTS_VALUE ? packet->pts : packet->dts;
+        if (result < 0)
+            return;
+        if (packet->stream_index != stream || stamp == AV_NOPTS_VALUE)
+            continue;
+        const int64_t begin = reader.MediaTime(stamp, found.time_base);
+        if (begin >= wish.end)
+            return;
+        const int64_t duration = av_rescale_q(packet->duration, found.time_base, {1, kTicksPerSecond});
+        Add(list, std::move(packet), begin, duration);
+    }
+}
+
+void ReadFile(CueList& list, const BurnWish& wish) {
+    try {
+        SubtitleFile file(wish.what, wish.charset);
+        const AVStream& stream = file.Stream();
+        CheckDecodable(*stream.codecpar, wish);
+        list.parameters = CopyOf(*stream.codecpar);
+        while (av::Packet packet = file.Take().packet) {
+            const auto ticks = [&](int64_t stamp) {
+                return av_rescale_q(stamp, stream.time_base, {1, kTicksPerSecond});
+            };
+            if (packet->pts != AV_NOPTS_VALUE)
+                Add(list, std::move(packet), ticks(packet->pts), ticks(packet->duration));
+        }
+    } catch (const TrackError&) {
+        throw;
+    } catch (const SourceError& error) {
+        throw TrackError(error.what());
+    }
+}
+
+} // namespace
+
+bool NamesStream(const BurnWish& wish) {
+    return !wish.what.empty() && std::all_of(wish.what.begin(), wish.what.end(),
+                                             [](char letter) { return letter >= '0' && letter <= '9'; });
+}
+
+bool CueList::IsText() const {
+    const AVCodecDescriptor* descriptor = avcodec_descriptor_get(parameters->codec_id);
+    return descriptor != nullptr && (descriptor->props & AV_CODEC_PROP_TEXT_SUB) != 0;
+}
+
+CueList ReadCues(const Source& source, const BurnWish& wish, bool playlists) {
+    CueList list;
+    if (NamesStream(wish))
+        ReadStream(list, source, wish, playlists);
+    else
+        ReadFile(list, wish);
+    std::stable_sort(
+        list.cues.begin(), list.cues.end(),
+        [](const CueList::Cue& one, const CueList::Cue& other) { return one.begin < other.begin; });
+    return list;
+}
+
+} // namespace movieconv

@@ -1,0 +1,32 @@
+// Draws subtitles into pictures.
+#ifndef MOVIECONV_HOST_SOURCE_SUBTITLEBURNER_H
+#define MOVIECONV_HOST_SOURCE_SUBTITLEBURNER_H
+
+#include "host/source/BurnWish.h"
+#include "host/source/CueDrawer.h"
+#include "host/source/Overlay.h"
+#include "host/source/Source.h"
+
+#include <cstdint>
+#include <memory>
+
+namespace movieconv {
+
+class SubtitleBurner {
+public:
+    /// Reads the subtitles that `choice` wants in the pictures. Throws TrackError when there are none such.
+    SubtitleBurner(const Source& source, const SourceChoice& choice);
+
+    /// Draws what is to be seen at `time` (media time) into a picture as PictureConverter gives it. Times
+    /// rise. Throws SourceError.
+    void Draw(AVFrame& picture, int64_t time);
+
+private:
+    const OverlayColours colours_;
+    std::unique_ptr<CueDrawer> drawer_;
+    Overlay overlay_;
+};
+
+} // namespace movieconv
+
+#endif

@@ -1,0 +1,265 @@
+// Movies whose texts and tracks are not as they should be.
+#include "tests/support/Folder.h"
+#include "tests/support/Program.h"
+#include "tests/support/TestMovies.h"
+#include "tests/terminal/WholeMovie.h"
+
+#include <algorithm>
+#include <gtest/gtest.h>
+
+namespace {
+
+using program::Call;
+using program::Result;
+using test_movies::Args;
+using test_movies::Join;
+using whole_movie::Json;
+
+const Args kMovie{"-f", "lavfi", "-i", "testsrc=s=64x48:r=10:d=2", "-f", "lavfi", "-i", "sine=d=2:r=8000"};
+
+/// Two seconds in Matroska with these texts of FFmpeg's form.
+std::string WithNotes(const Folder& folder, const std::string& notes) {
+    WriteFile(folder / "notes.txt", ";FFMETADATA1\n" + notes);
+    const Result made =
+        program::Run(Join(Args{"ffmpeg", "-v", "error", "-y"}, kMovie,
+                          Args{"-i", folder / "notes.txt", "-map_metadata", "2", "-map_chapters", "2", "-c:v",
+                               "mpeg4", "-c:a", "flac", folder / "in.mkv"}));
+    EXPECT_EQ(made.code, 0) << made.err;
+    return folder / "in.mkv";
+}
+
+std::string Chapter(int begin, int end, const std::string& title) {
+    return "[CHAPTER]\nTIMEBASE=1/1000\nSTART=" + std::to_string(begin) + "\nEND=" + std::to_string(end) +
+           "\n" + (title.empty() ? "" : "title=" + title + "\n");
+}
+
+std::string Chapters(const std::string& path) {
+    std::string text;
+    const Json probe = whole_movie::Probe(path);
+    for (const Json& chapter : probe["chapters"]) {
+        const auto time = [&](const char* key) { return chapter[key].get<std::string>().substr(0, 4); };
+        text += time("start_time") + "-" + time("end_time") + " ";
+        text += (chapter.contains("tags") ? chapter["tags"].value("title", "") : "") + "; ";
+    }
+    return text;
+}
+
+TEST(BrokenMovie, ChaptersAreCutToTheMovie) {
+    std::string many;
+    std::string expected;
+    for (int i = 0; i < 300; ++i)
+        many += Chapter(i * 5, i * 5 + 5, "C" + std::to_string(i));
+    const struct {
+        std::string notes;
+        const char* chapters; // null: any, 300
+    } cases[] = {
+        {Chapter(0, 1000, "One") + Chapter(1000, 9000, "Two") + Chapter(9000, 10000, "Never"),
+         "0.00-1.00 One; 1.00-2.00 Two; "},
+        {Chapter(0, 1500, "One") + Chapter(500, 2000, "Two"), "0.00-1.50 One; 0.50-2.00 Two; "},
+        {Chapter(0, 500, "") + Chapter(500, 2000, "Two"), "0.00-0.50 ; 0.50-2.00 Two; "},
+        {many, nullptr},
+    };
+    for (const auto& test : cases)
+        for (const char* name : {"out.mp4", "out.mkv"}) {
+            SCOPED_TRACE(test.notes.substr(0, 100) + name);
+            const Folder folder;
+            const Result made = Call({WithNotes(folder, test.notes), folder / name, "--audio-codec",
+                                      std::string(name) == "out.mkv" ? "FLAC" : "AAC", "--progress", "none"});
+            ASSERT_EQ(made.code, 0) << made.err;
+            if (test.chapters == nullptr) {
+                EXPECT_EQ(whole_movie::Probe(folder / name)["chapters"].size(), 300);
+            } else if (std::string(name) == "out.mkv" ||
+                       std::string(test.chapters).find("1.50") == std::string::npos) {
+                EXPECT_EQ(Chapters(folder / name), test.chapters);
+            } else { // MP4's chapters follow each other
+                EXPECT_EQ(Chapters(folder / name), "0.00-0.50 One; 0.50-2.00 Two; ");
+            }
+        }
+}
+
+TEST(BrokenMovie, TextsInOldCharacterSetsAndLongOnes) {
+    const Folder folder;
+    const std::string lengthy(100000, 'x');
+    const std::string movie = WithNotes(folder, "title=Gr\xFC\xDF"
+                                                "e\nartist=\x80uro\ncomment=" +
+                                                    lengthy + "\nempty=\n");
+    for (const char* name : {"out.mp4", "out.mkv", "out.webm", "out.mov", "out.avi", "out.flv", "out.mp3",
+                             "out.ogg", "out.flac", "out.wav"}) {
+        SCOPED_TRACE(name);
+        const Result made = Call({movie, folder / name, "--progress", "json"});
+        ASSERT_EQ(made.code, 0) << made.err;
+        const auto tags = whole_movie::TagsOf(whole_movie::Probe(folder / name));
+        const auto value = [&](const std::string& key) {
+            const auto found =
+                std::find_if(tags.begin(), tags.end(), [&](const auto& tag) { return tag.first == key; });
+            return found != tags.end() ? found->second : std::string();
+        };
+        EXPECT_EQ(value("title"), "Gr\xC3\xBC\xC3\x9F"
+                                  "e");
+        EXPECT_EQ(value("artist"), "\xE2\x82\xACuro");
+        EXPECT_TRUE(value("comment") == lengthy || made.out.find("COMMENT") != std::string::npos)
+            << value("comment").size();
+    }
+    const Result info = Call({"--info", movie, "--progress", "json"});
+    EXPECT_TRUE(Json::accept(info.out)) << info.out.substr(0, 200);
+}
+
+TEST(BrokenMovie, ALargeCover) {
+    const Folder folder;
+    ASSERT_EQ(program::Run({"ffmpeg", "-v", "error", "-f", "lavfi", "-i", "testsrc=s=64x64", "-frames:v", "1",
+                            folder / "cover.png"})
+                  .code,
+              0);
+    const std::string cover = ReadFile(folder / "cover.png") + std::string(20'000'000, 'x');
+    WriteFile(folder / "cover.png", cover);
+    ASSERT_EQ(program::Run(Join(Args{"ffmpeg", "-v", "error"}, kMovie,
+                                Args{"-c:v", "mpeg4", "-c:a", "flac", "-attach", folder / "cover.png",
+                                     "-metadata:s:t", "mimetype=image/png", folder / "in.mkv"}))
+                  .code,
+              0);
+    for (const char* name : {"out.mp4", "out.mkv", "out.m4a", "out.mp3", "out.flac"}) {
+        SCOPED_TRACE(name);
+        const Result made = Call({folder / "in.mkv", folder / name, "--progress", "json"});
+        ASSERT_EQ(made.code, 0) << made.err;
+        const Json streams = whole_movie::Probe(folder / name)["streams"];
+        const bool isThere = std::any_of(streams.begin(), streams.end(), [](const Json& stream) {
+            return stream["disposition"]["attached_pic"] == 1;
+        });
+        EXPECT_NE(isThere, made.out.find("\"kind\":\"cover\"") != std::string::npos);
+        if (isThere) {
+            EXPECT_GT(ReadFile(folder / name).size(), cover.size());
+        }
+    }
+}
+
+/// Languages as containers and people write them, and what becomes of them.
+TEST(BrokenMovie, LanguagesOfEveryKind) {
+    const struct {
+        const char* source;
+        const char* inMkv;
+        const char* inMp4; // empty: told
+        const char* inMov;
+    } cases[] = {
+        {"deu", "deu", "deu", "ger"}, {"ger", "ger", "ger", "ger"},   {"de", "ger", "ger", "ger"},
+        {"GER", "ger", "ger", "ger"}, {"pt-BR", "por", "por", "por"}, {"swe", "swe", "swe", "sve"},
+        {"sve", "swe", "swe", "sve"}, {"fre", "fre", "fre", "fra"},   {"hrv", "hrv", "hrv", "hr "},
+        {"nob", "nob", "nob", "nor"}, {"fil", "fil", "fil", ""},      {"und", "", "", ""},
+        {"xx", "xx", "", ""},         {"english", "english", "", ""},
+    };
+    const Folder folder;
+    Args make = Join(Args{"ffmpeg", "-v", "error"}, kMovie, Args{"-map", "0"});
+    int number = 0;
+    for (const auto& test : cases)
+        make = Join(make, Args{"-map", "1", "-metadata:s:a:" + std::to_string(number++),
+                               std::string("language=") + test.source});
+    ASSERT_EQ(program::Run(Join(make, Args{"-c:v", "mpeg4", "-c:a", "flac", folder / "in.mkv"})).code, 0);
+    for (const std::string extension : {"mkv", "mp4", "mov"}) {
+        SCOPED_TRACE(extension);
+        const Result made =
+            Call({folder / "in.mkv", folder / ("out." + extension), "--length", "0.3", "--progress", "json"});
+        ASSERT_EQ(made.code, 0) << made.err;
+        std::vector<std::string> found;
+        const Json probe = whole_movie::Probe(folder / ("out." + extension));
+        for (const Json& stream : probe["streams"])
+            if (stream["codec_type"] == "audio")
+                found.push_back(stream.contains("tags") ? stream["tags"].value("language", "") : "");
+        ASSERT_EQ(found.size(), std::size(cases));
+        for (size_t i = 0; i < found.size(); ++i) {
+            SCOPED_TRACE(cases[i].source);
+            const std::string expected = extension == "mkv"   ? cases[i].inMkv
+                                         : extension == "mp4" ? cases[i].inMp4
+                                                              : cases[i].inMov;
+            EXPECT_EQ(found[i] == "und" ? "" : found[i], expected);
+            const std::string told = "\"kind\":\"label\",\"number\":" + std::to_string(i + 1) + ",";
+            EXPECT_EQ(made.out.find(told) != std::string::npos,
+                      expected.empty() && std::string(cases[i].source) != "und");
+        }
+    }
+}
+
+/// A further track that begins late and ends early, and one whose shape changes on the way.
+TEST(BrokenMovie, TracksThatChangeOnTheWay) {
+    const Folder folder;
+    const auto part = [&](const char* name, const char* size, const char* layout, const char* rate) {
+        ASSERT_EQ(program::Run({"ffmpeg",
+                                "-v",
+                                "error",
+                                "-f",
+                                "lavfi",
+                                "-i",
+                                std::string("testsrc=r=25:d=2:s=") + size,
+                                "-f",
+                                "lavfi",
+                                "-i",
+                                "sine=d=2:r=48000",
+                                "-f",
+                                "lavfi",
+                                "-i",
+                                std::string("anoisesrc=d=2:a=0.3:r=") + rate,
+                                "-map",
+                                "0",
+                                "-map",
+                                "1",
+                                "-map",
+                                "2",
+                                "-c:v",
+                                "mpeg2video",
+                                "-c:a",
+                                "mp2",
+                                "-ac:a:1",
+                                layout,
+                                "-ar:a:1",
+                                rate,
+                                folder / name})
+                      .code,
+                  0);
+    };
+    part("a.ts", "160x120", "1", "48000");
+    part("b.ts", "128x96", "2", "32000");
+    WriteFile(folder / "both.ts", ReadFile(folder / "a.ts") + ReadFile(folder / "b.ts"));
+    ASSERT_EQ(program::Run({"ffmpeg",
+                            "-v",
+                            "error",
+                            "-f",
+                            "lavfi",
+                            "-i",
+                            "testsrc=s=64x48:r=10:d=4",
+                            "-f",
+                            "lavfi",
+                            "-i",
+                            "sine=d=4:r=48000",
+                            "-f",
+                            "lavfi",
+                            "-itsoffset",
+                            "1.5",
+                            "-i",
+                            "sine=d=1:r=48000",
+                            "-map",
+                            "0",
+                            "-map",
+                            "1",
+                            "-map",
+                            "2",
+                            "-c:v",
+                            "mpeg4",
+                            "-c:a",
+                            "flac",
+                            folder / "short.mkv"})
+                  .code,
+              0);
+    for (const char* source : {"both.ts", "short.mkv"})
+        for (const char* name : {"out.mp4", "out.mkv"}) {
+            SCOPED_TRACE(std::string(source) + name);
+            const Result made = Call({folder / source, folder / name, "-y", "-q"});
+            ASSERT_EQ(made.code, 0) << made.err;
+            const Json probe = whole_movie::Probe(folder / name);
+            EXPECT_NEAR(std::stod(probe["format"]["duration"].get<std::string>()), 4, 0.2);
+            const Result sound = program::Run({"ffmpeg", "-v", "error", "-i", folder / name, "-map", "0:a:1",
+                                               "-ac", "1", "-ar", "8000", "-f", "s16le", "-"});
+            EXPECT_EQ(sound.err, "");
+            const bool isShort = std::string(source) == "short.mkv";
+            EXPECT_NEAR(static_cast<double>(sound.out.size()) / 16000, isShort ? 2.5 : 4, 0.2);
+        }
+}
+
+} // namespace

@@ -1,0 +1,217 @@
+// Subtitles drawn into pictures: where they are seen, and when.
+#include "tests/support/Folder.h"
+#include "tests/support/Program.h"
+#include "tests/support/TestMovies.h"
+#include "tests/terminal/WholeMovie.h"
+
+#include <algorithm>
+#include <cstdlib>
+#include <gtest/gtest.h>
+
+namespace {
+
+using program::Call;
+using program::Result;
+using test_movies::Args;
+using test_movies::Join;
+
+/// What is bright in a picture; empty where nothing is.
+struct Box {
+    int left = 0;
+    int top = 0;
+    int right = 0;
+    int bottom = 0;
+
+    bool Empty() const { return right <= left; }
+};
+
+Box BrightPart(const unsigned char* picture, int width, int height) {
+    constexpr int kBright = 100;
+    Box box{width, height, 0, 0};
+    for (int y = 0; y < height; ++y)
+        for (int x = 0; x < width; ++x)
+            if (picture[y * width + x] > kBright)
+                box = {std::min(box.left, x), std::min(box.top, y), std::max(box.right, x + 1), y + 1};
+    return box;
+}
+
+/// Of every picture of a movie of that size.
+std::vector<Box> BoxesOf(const std::string& path, int width, int height) {
+    const std::string rows = program::Run({"ffmpeg", "-v", "error", "-i", path, "-map", "0:v:0", "-f",
+                                           "rawvideo", "-pix_fmt", "gray", "-"})
+                                 .out;
+    const auto size = static_cast<size_t>(width * height);
+    EXPECT_EQ(rows.size() % size, 0);
+    std::vector<Box> boxes;
+    for (size_t at = 0; at + size <= rows.size(); at += size)
+        boxes.push_back(BrightPart(reinterpret_cast<const unsigned char*>(rows.data()) + at, width, height));
+    return boxes;
+}
+
+/// "..##" for pictures without and with something bright.
+std::string Timeline(const std::vector<Box>& boxes) {
+    std::string line;
+    for (const Box& box : boxes)
+        line += box.Empty() ? '.' : '#';
+    return line;
+}
+
+Box All(const std::vector<Box>& boxes) {
+    Box all;
+    for (const Box& box : boxes)
+        if (!box.Empty())
+            all = all.Empty() ? box
+                              : Box{std::min(all.left, box.left), std::min(all.top, box.top),
+                                    std::max(all.right, box.right), std::max(all.bottom, box.bottom)};
+    return all;
+}
+
+/// The black movie converted without loss, with these options.
+std::vector<Box> Burn(const Args& options, int width = 160, int height = 120,
+                      const std::string& name = "out.mkv") {
+    const Folder folder;
+    const Result made = Call(Join(Args{whole_movie::Make(true), folder / name, "--video-codec", "FFV1",
+                                       "--no-audio", "--progress", "none"},
+                                  options));
+    EXPECT_EQ(made.code, 0) << made.err;
+    std::vector<Box> boxes;
+    for (const std::string& file : folder.Names()) {
+        const std::vector<Box> part = BoxesOf(folder / file, width, height);
+        boxes.insert(boxes.end(), part.begin(), part.end());
+    }
+    return boxes;
+}
+
+constexpr char kWordsLine[] = ".....#######..##########......";
+constexpr char kSignsLine[] = "...#################..........";
+
+TEST(Burn, DrawsEveryKindAtItsTimeAndPlace) {
+    // Texts at the bottom in the middle, a sign at its place, bitmaps to the pixel.
+    const std::vector<Box> words = Burn({"--burn-subtitles", "4"});
+    EXPECT_EQ(Timeline(words), kWordsLine);
+    EXPECT_GT(All(words).top, 90);
+    EXPECT_NEAR(All(words).left + All(words).right, 160, 6);
+    const std::vector<Box> signs = Burn({"--burn-subtitles", "5"});
+    EXPECT_EQ(Timeline(signs), kSignsLine);
+    EXPECT_LT(signs[5].bottom, 40);
+    EXPECT_NEAR(signs[5].left + signs[5].right, 40, 40);
+    EXPECT_EQ(Timeline(Burn({"--burn-subtitles", "6"})), "..######.......##########.....");
+    for (const char* number : {"6", "7", "8"}) {
+        SCOPED_TRACE(number);
+        const std::vector<Box> bits = Burn({"--burn-subtitles", number});
+        EXPECT_EQ(Timeline(bits).substr(0, 8), "..######"); // some copies do not tell where a cue ends
+        EXPECT_NEAR(All(bits).left, 50, 1);
+        EXPECT_NEAR(All(bits).top, 90, 1);
+        EXPECT_NEAR(All(bits).right, 110, 1);
+        EXPECT_NEAR(All(bits).bottom, 106, 1);
+    }
+}
+
+TEST(Burn, FollowsRangesClipsCroppingAndScaling) {
+    EXPECT_EQ(Timeline(Burn({"--burn-subtitles", "4", "--begin", "1", "--length", "1"})), "##..######");
+    EXPECT_EQ(Timeline(Burn({"--burn-subtitles", "5", "--begin", "1.2"})),
+              std::string(kSignsLine).substr(12));
+    EXPECT_EQ(Timeline(Burn({"--burn-subtitles", "6", "--begin", "0.5", "--length", "0.5"})), "###..");
+    EXPECT_EQ(Timeline(Burn({"--burn-subtitles", "4", "--split", "0.9"})), kWordsLine);
+    EXPECT_EQ(Timeline(Burn({"--burn-subtitles", "4", "--jobs", "2", "--pieces", "3"})), kWordsLine);
+    // What would be cut off is moved into the picture.
+    const Box cropped = All(Burn({"--burn-subtitles", "6", "--crop", "20:30:0:0"}, 160, 70));
+    EXPECT_NEAR(cropped.bottom, 70, 1);
+    EXPECT_NEAR(cropped.bottom - cropped.top, 16, 1);
+    const Box text = All(Burn({"--burn-subtitles", "4", "--crop", "20:30:0:0"}, 160, 70));
+    EXPECT_GT(text.top, 45);
+    EXPECT_LT(text.bottom, 70);
+    const Box scaled = All(Burn({"--burn-subtitles", "6", "--size", "320x240"}, 320, 240));
+    EXPECT_NEAR(scaled.left, 100, 3);
+    EXPECT_NEAR(scaled.bottom, 212, 3);
+}
+
+TEST(Burn, TakesFilesAndTheFontsOfTheSource) {
+    const Folder folder;
+    WriteFile(folder / "latin.srt", "1\n00:00:01,000 --> 00:00:02,000\nGr\xFC\xDF"
+                                    "e\n");
+    EXPECT_EQ(Timeline(Burn({"--burn-subtitles", folder / "latin.srt"})), "..........##########..........");
+    // A typeface that only the movie has: all letters as wide as each other, under a new name.
+    std::string font = ReadFile("/usr/share/fonts/truetype/dejavu/DejaVuSansMono.ttf");
+    if (font.empty())
+        GTEST_SKIP() << "without the typeface";
+    for (std::string name : {std::string("DejaVu Sans Mono"), std::string("DejaVuSansMono")}) {
+        std::string wide;
+        for (const char letter : name)
+            wide += std::string(1, '\0') + letter;
+        for (const std::string& form : {name, wide})
+            for (size_t at = 0; (at = font.find(form, at)) != std::string::npos; at += form.size())
+                font[at + form.size() - 1] = 'X';
+    }
+    WriteFile(folder / "own.ttf", font);
+    WriteFile(
+        folder / "own.ass",
+        "[Script Info]\nScriptType: v4.00+\nPlayResX: 160\nPlayResY: 120\n\n[V4+ Styles]\n"
+        "Format: Name, Fontname, Fontsize, PrimaryColour, SecondaryColour, OutlineColour, BackColour, "
+        "Bold, Italic, Underline, StrikeOut, ScaleX, ScaleY, Spacing, Angle, BorderStyle, Outline, "
+        "Shadow, Alignment, MarginL, MarginR, MarginV, Encoding\n"
+        "Style: Default,DejaVu Sans MonX,20,&H00FFFFFF,&H0,&H0,&H0,0,0,0,0,100,100,0,0,1,0,0,5,5,5,5,1\n"
+        "\n[Events]\n"
+        "Format: Layer, Start, End, Style, Name, MarginL, MarginR, MarginV, Effect, Text\n"
+        "Dialogue: 0,0:00:00.00,0:00:01.00,Default,,0,0,0,,iiiiii\n");
+    const auto width = [&](bool attached) {
+        Args make{"ffmpeg", "-v",
+                  "error",  "-y",
+                  "-f",     "lavfi",
+                  "-i",     "color=black:s=160x120:r=10:d=1",
+                  "-i",     folder / "own.ass",
+                  "-c:s",   "copy",
+                  "-c:v",   "ffv1"};
+        if (attached)
+            make = Join(make, Args{"-attach", folder / "own.ttf", "-metadata:s:t", "mimetype=font/ttf"});
+        EXPECT_EQ(program::Run(Join(make, Args{folder / "font.mkv"})).code, 0);
+        const Result made = Call({folder / "font.mkv", folder / "out.mkv", "--burn-subtitles", "1",
+                                  "--video-codec", "FFV1", "-y", "-q"});
+        EXPECT_EQ(made.code, 0) << made.err;
+        const Box box = All(BoxesOf(folder / "out.mkv", 160, 120));
+        return box.right - box.left;
+    };
+    EXPECT_GT(width(true), width(false) * 3 / 2);
+}
+
+TEST(Burn, LeavesTheTrackOutUnlessItIsAskedFor) {
+    const Folder folder;
+    const auto texts = [&](const Args& options) {
+        const Result made = Call(Join(
+            Args{whole_movie::Make(true), folder / "out.mp4", "--burn-subtitles", "4", "-y", "-q"}, options));
+        EXPECT_EQ(made.code, 0) << made.err;
+        std::string titles;
+        const whole_movie::Json probe = whole_movie::Probe(folder / "out.mp4");
+        for (const whole_movie::Json& stream : probe["streams"])
+            if (stream["codec_name"] == "mov_text")
+                titles += stream["tags"].value("language", "") + " ";
+        return titles;
+    };
+    EXPECT_EQ(texts({}), "jpn ");
+    EXPECT_EQ(texts({"--subtitles", "ger,5"}), "ger jpn ");
+    EXPECT_EQ(texts({"--subtitles", "none"}), "");
+}
+
+TEST(Burn, RefusesWhatIsNotThere) {
+    const Folder folder;
+    const struct {
+        Args arguments;
+        const char* text;
+    } cases[] = {
+        {{"out.mp4", "--burn-subtitles", "99"}, "there are no subtitles \"99\"; there are: 4 (ger), 5 (jpn)"},
+        {{"out.mp4", "--burn-subtitles", "1"}, "there are no subtitles \"1\""},
+        {{"out.mp4", "--burn-subtitles", "/nowhere.srt"}, "cannot open \"/nowhere.srt\""},
+        {{"out.mp3", "--burn-subtitles", "4"}, "there are no pictures"},
+        {{"out.mp4", "--burn-subtitles", "4", "--no-video"}, "there are no pictures"},
+    };
+    for (const auto& test : cases) {
+        Args arguments = test.arguments;
+        arguments[0] = folder / arguments[0];
+        const Result made = Call(Join(Args{whole_movie::Make(true)}, arguments));
+        EXPECT_EQ(made.code, 2) << made.err;
+        EXPECT_NE(made.err.find(test.text), std::string::npos) << made.err;
+    }
+    EXPECT_TRUE(folder.Names().empty());
+}
+
+} // namespace
