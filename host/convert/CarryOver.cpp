@@ -157,7 +157,7 @@ std::string WhySubtitlesStay(const StreamInfo& stream, const FileFormatInfo& for
 
 /// What `read` gives, with its errors as failures.
 template <class Function>
-auto& Opened(Function read) {
+auto& OpenedBeside(Function read) {
     try {
         return read();
     } catch (const SourceError& error) {
@@ -192,7 +192,7 @@ public:
     /// Returns why not, or nothing.
     std::optional<NotCarried> AddFile(const SubtitleFileWish& wish, const std::string& charset) {
         const AVStream* described = nullptr;
-        BesidePackets& source = Opened(
+        BesidePackets& source = OpenedBeside(
             [&]() -> BesidePackets& { return movie_.ReadSubtitleFile(wish.path, charset, described); });
         StreamInfo stream;
         stream.kind = StreamKind::kSubtitles;
@@ -217,7 +217,7 @@ public:
         int number = kWriterTrackFurther;
         for (Track& each : tracks_) {
             if (each.copied != nullptr)
-                each.track.pParameters = &Opened(
+                each.track.pParameters = &OpenedBeside(
                     [&]() -> const AVCodecParameters& { return movie_.DescribeCopied(*each.copied); });
             each.track.pfnNext = TakeNext;
             each.track.pContext = each.source;

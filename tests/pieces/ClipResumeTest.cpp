@@ -1,4 +1,5 @@
 // The program's conversions into clips that break off, and the same command with --resume.
+#include "tests/pieces/ExitCodes.h"
 #include "tests/pieces/Packets.h"
 #include "tests/support/Folder.h"
 #include "tests/support/Program.h"
@@ -21,13 +22,6 @@ using program::Result;
 using program::Running;
 using test_movies::Args;
 using test_movies::Join;
-
-constexpr int kUsage = 2;
-constexpr int kCannotWrite = 4;
-
-bool Has(const std::string& text, const std::string& part) {
-    return text.find(part) != std::string::npos;
-}
 
 /// Ten clips of two seconds, with pictures that build on later ones and sound that ends early.
 std::string ClipSource() {

@@ -1,4 +1,5 @@
 // The program's plans, pieces and joins, as a farm and as people use them.
+#include "tests/pieces/ExitCodes.h"
 #include "tests/pieces/Packets.h"
 #include "tests/support/Folder.h"
 #include "tests/support/Program.h"
@@ -22,12 +23,6 @@ using program::Call;
 using program::Result;
 using program::Running;
 using test_movies::Args;
-
-constexpr int kUsage = 2;
-constexpr int kCannotRead = 3;
-constexpr int kCannotWrite = 4;
-constexpr int kNoSpace = 5;
-constexpr int kStopped = 6;
 
 /// Eight seconds, plain but for sound that ends early.
 std::string Source() {
