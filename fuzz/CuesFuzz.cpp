@@ -130,8 +130,8 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
     const std::string rest = input.ConsumeRemainingBytesAsString();
     const char* const heads[] = {"", "1\n00:00:01,000 --> 00:00:02,500\n",
                                  "WEBVTT\n\n00:01.000 --> 00:02.000\n",
-                                 "[Script Info]\nScriptType: v4.00+\n[Events]\n"
-                                 "Dialogue: 0,0:00:01.00,0:00:02.00,Default,,0,0,0,,"};
+                                 ("[Script Info]\nScriptType: v4.00+\n[Events]\n"
+                                  "Dialogue: 0,0:00:01.00,0:00:02.00,Default,,0,0,0,,")};
     const std::string text = heads[kind] + rest;
     try {
         const std::string converted = ToUtf8(text, charset);
