@@ -56,8 +56,10 @@ SubtitleBurner::SubtitleBurner(const Source& source, const SourceChoice& choice)
     : colours_(ColoursFor(*source.Info().pictures, choice.keepHdr)) {
     CueList list = ReadCues(source, *choice.burn, choice.playlists);
     const PictureStreamInfo& pictures = *source.Info().pictures;
-    drawer_ = list.IsText() ? MakeTextDrawer(std::move(list), pictures, FontsOf(source))
-                            : MakeBitmapDrawer(std::move(list), pictures);
+    if (list.IsText())
+        drawer_ = MakeTextDrawer(std::move(list), pictures, FontsOf(source));
+    else
+        drawer_ = MakeBitmapDrawer(std::move(list), pictures);
 }
 
 void SubtitleBurner::Draw(AVFrame& picture, int64_t time) {
