@@ -389,8 +389,8 @@ std::string UsualTextCodec(const std::string& path) {
 }
 
 NotCarried LeftOf(const StreamInfo& stream, std::string reason) {
-    return {std::string(KindName(stream.kind)), stream.index, stream.codec, stream.language,
-            std::move(reason)};
+    const std::string& what = stream.codec == "none" ? stream.fileName : stream.codec;
+    return {std::string(KindName(stream.kind)), stream.index, what, stream.language, std::move(reason)};
 }
 
 /// Without what is drawn into the pictures, unless it is asked for by name.

@@ -82,9 +82,9 @@ struct NotCarried {
     /// that is carried, "label".
     std::string kind;
     std::optional<int> number; ///< Of the stream in the source; nothing for chapters and tags.
-    std::string codec;
-    std::string language; ///< Empty when it is not known.
-    std::string reason;   ///< A clause.
+    std::string codec;         ///< Of an attached file of no codec its name. Empty when it is not known.
+    std::string language;      ///< Empty when it is not known.
+    std::string reason;        ///< A clause.
 };
 
 /// A picture for display: blue, green, red and 255 for each pixel, without gaps, top row first.
