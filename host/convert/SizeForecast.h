@@ -17,7 +17,7 @@ public:
     /// `bytes` are in the output when so many seconds of the source were converted. Neither falls.
     void Add(double position, int64_t bytes);
 
-    /// Of the whole output; nothing before ten seconds of the source, or while nothing more was written.
+    /// Of the whole output; nothing before ten seconds of the source and three lumps of bytes.
     std::optional<ByteRange> Total(double length) const;
 
 private:

@@ -5,6 +5,8 @@
 
 #include <gtest/gtest.h>
 
+#include <cmath>
+
 namespace {
 
 using namespace movieconv;
@@ -53,6 +55,19 @@ std::optional<ByteRange> Foretell(double seconds, double rate(double position)) 
         bytes += rate(position) / 2;
     }
     return forecast.Total(100);
+}
+
+TEST(SizeForecast, TakesNoWaitForALumpForAnEnd) {
+    SizeForecast forecast;
+    for (double position = 0; position <= 24; position += 0.5) {
+        const double written = std::floor(position / 5) * 5; // seconds
+        forecast.Add(position, static_cast<int64_t>(5000 + written * 1000));
+        if (const auto range = forecast.Total(100)) {
+            EXPECT_LE(range->least, 105'000) << position;
+            EXPECT_GE(range->most, 105'000) << position;
+        }
+    }
+    EXPECT_TRUE(forecast.Total(100));
 }
 
 TEST(SizeForecast, NarrowsDownToTheTruth) {
