@@ -101,6 +101,7 @@ TEST_F(PicturesTest, ConvertsMoviesWithALivePicture) {
     const auto* picture = app.Window().findChild<PictureView*>();
     ASSERT_TRUE(Await(
         [&] { return !picture->Picture().isNull() && (At(0).figures.fraction > 0.3 || At(0).IsOver()); }));
+    QApplication::processEvents(); // the words just shown get their places
     Photograph("work");
     ASSERT_TRUE(AwaitDone());
     for (size_t row = 0; row < 4; ++row) {

@@ -85,6 +85,8 @@ QLayout* EntryPage::MakeHead() {
 QFormLayout* EntryPage::MakeForm() {
     preset_ = new QComboBox;
     description_ = MakeHint();
+    description_->setWordWrap(false); // the form keeps a second line's room once it had one
+    description_->setMinimumWidth(1);
     format_ = new QComboBox;
     size_ = new QComboBox;
     quality_ = new QSlider(Qt::Horizontal);
@@ -307,6 +309,7 @@ void EntryPage::ShowWishes() {
     ChooseItem(*preset_, wishes.preset);
     const PresetFacts* preset = CurrentPreset();
     description_->setText(preset != nullptr ? preset->description : QString());
+    description_->setToolTip(description_->text()); // a narrow window cuts it
     format_->setItemText(0, preset != nullptr ? tr("The preset's (.%1)").arg(preset->extension)
                                               : tr("The preset's"));
     ChooseItem(*format_, DataOf(wishes.format));
