@@ -2,8 +2,12 @@
 
 #include "host/convert/Failure.h"
 #include "host/convert/OutputCheck.h"
+#include "text/FileNames.h"
 
 #include <fmt/format.h>
+#include <string>
+#include <string_view>
+#include <unistd.h>
 #include <utility>
 
 namespace movieconv {
@@ -40,6 +44,11 @@ void ClipRun::Prepare() {
 }
 
 void ClipRun::Start() {
+    if (request_.firstClip) { // what the run that broke off left of it
+        const auto number = static_cast<std::size_t>(request_.firstClip->number);
+        const std::string clip = text::ClipName(std::string_view(request_.output), number);
+        unlink((clip + text::PartialSuffix(1)).c_str());
+    }
     job_->Start();
 }
 

@@ -7,6 +7,7 @@
 #include "host/pieces/PieceFile.h"
 #include "host/pieces/WholeFile.h"
 #include "host/source/MediaTime.h"
+#include "text/FileNames.h"
 
 #include <algorithm>
 #include <filesystem>
@@ -264,6 +265,8 @@ void Foreman::ReportFinishing(double share) {
 }
 
 void Foreman::JoinAll() {
+    if (order_.resume) // what a killed joining left
+        unlink((plan_.output + text::PartialSuffix(1)).c_str());
     ReportFinishing(0);
     double told = 0;
     Verdict joined = JoinPieces(plan_, order_.planPath, order_.replace, News(), [&](double share) {

@@ -83,7 +83,7 @@ TEST(ClipsLeft, AreGoneOnWithAtTheFirstOneMissing) {
     const Result resumed = killed.Resume();
     ASSERT_EQ(resumed.code, 0) << resumed.err;
     EXPECT_TRUE(Has(resumed.out + resumed.err, told)) << resumed.out << resumed.err;
-    EXPECT_EQ(killed.Names(), calm.Names()) << "all clips, and nothing that lists them";
+    EXPECT_EQ(killed.folder.Names(), calm.Names()) << "all clips, and nothing that lists them";
     EXPECT_EQ(std::filesystem::last_write_time(killed.Clip(1)), before);
     for (const std::string& name : calm.Names())
         EXPECT_EQ(Times(killed.folder / name), Times(calm / name)) << name;
