@@ -40,7 +40,8 @@ struct Progress {
     std::optional<double> speed;   ///< Seconds of source a second of work.
     std::optional<double> left;    ///< Seconds of work for the rest.
     int64_t bytes = 0;             ///< In the output so far, all clips.
-    /// Bytes that the whole output is going to have, about: where no rate tells it before, from ten seconds on.
+    /// Bytes that the whole output is going to have, about: where no rate tells it before, from ten seconds
+    /// on.
     std::optional<ByteRange> expected;
     double worked = 0;   ///< Seconds, pauses left out.
     double finished = 0; ///< Of the finishing phase, 0 to 1.
