@@ -1,7 +1,8 @@
 #include "host/convert/CarryOver.h"
 
+#include "host/convert/CarryTexts.h"
 #include "host/convert/CodecPlan.h"
-#include "host/source/Languages.h"
+#include "host/convert/Formats.h"
 #include "host/source/MediaTime.h"
 #include "host/source/SourceError.h"
 #include "host/source/StreamChoice.h"
@@ -10,8 +11,6 @@
 #include "writer/WriterStatus.h"
 
 #include <algorithm>
-#include <cctype>
-#include <cmath>
 #include <cstddef>
 #include <fmt/format.h>
 #include <new>
@@ -27,116 +26,12 @@ constexpr std::string_view kChapterTrack = "bin_data"; // MP4 holds the chapters
 
 constexpr int64_t kLargestCoverInFlac = 16'000'000; // with its description below 2^24
 
-int64_t Ticks(double seconds) {
-    return std::llround(seconds * kTicksPerSecond);
-}
-
-/// "MP4" of "MP4 (MPEG-4 Part 14)".
-std::string NameOf(const FileFormatInfo& format) {
-    const std::string name = format.szName;
-    return name.substr(0, name.find(" ("));
-}
-
-int Dispositions(const StreamFlags& flags) {
-    return (flags.isDefault ? AV_DISPOSITION_DEFAULT : 0) | (flags.forced ? AV_DISPOSITION_FORCED : 0) |
-           (flags.original ? AV_DISPOSITION_ORIGINAL : 0) | (flags.dub ? AV_DISPOSITION_DUB : 0) |
-           (flags.commentary ? AV_DISPOSITION_COMMENT : 0) |
-           (flags.hearingImpaired ? AV_DISPOSITION_HEARING_IMPAIRED : 0) |
-           (flags.visualImpaired ? AV_DISPOSITION_VISUAL_IMPAIRED : 0);
-}
-
-/// "a", "a and b", "a, b and c".
-std::string Enumerate(const std::vector<std::string>& names) {
-    std::string text;
-    for (std::size_t i = 0; i < names.size(); ++i)
-        text += (i == 0 ? "" : i + 1 == names.size() ? " and " : ", ") + names[i];
-    return text;
-}
-
-/// Says what a track is, as far as the format can. Returns what it cannot.
-std::optional<NotCarried> LabelTrack(const StreamInfo& stream, const Request& request,
-                                     const FileFormatInfo& format, uint32_t set, int track) {
-    std::vector<std::string> missing;
-    const auto carries = [&](const char* key, const std::string& value) {
-        return MWCarriesTrackTag(format.fccFormat, key, value.c_str()) != 0;
-    };
-    if (!stream.language.empty()) {
-        const std::vector<std::string> codes = CodesFor(stream.language);
-        const auto code = std::find_if(codes.begin(), codes.end(),
-                                       [&](const std::string& each) { return carries("language", each); });
-        if (code != codes.end())
-            MWSetTrackTag(set, track, "language", code->c_str());
-        else
-            missing.emplace_back("language");
-    }
-    if (!request.noMetadata && !stream.title.empty()) {
-        MWSetTrackTag(set, track, "title", stream.title.c_str());
-        if (!carries("title", stream.title))
-            missing.emplace_back("title");
-    }
-    const int flags = Dispositions(stream.flags);
-    MWSetTrackFlags(set, track, flags);
-    if ((flags & ~(MWCarriedTrackFlags(format.fccFormat) | AV_DISPOSITION_DEFAULT)) != 0)
-        missing.emplace_back("flags");
-    if (missing.empty())
-        return std::nullopt;
-    return NotCarried{"label", stream.index >= 0 ? std::optional(stream.index) : std::nullopt, stream.codec,
-                      stream.language,
-                      fmt::format("{} cannot hold its {}", NameOf(format), Enumerate(missing))};
-}
-
 const StreamInfo& StreamAt(const SourceInfo& source, int index) {
     return source.streams[static_cast<std::size_t>(index)];
 }
 
-bool AreAlike(std::string_view one, std::string_view other) {
-    return std::equal(one.begin(), one.end(), other.begin(), other.end(),
-                      [](unsigned char a, unsigned char b) { return std::tolower(a) == std::tolower(b); });
-}
-
 bool IsAmong(const std::vector<int>& list, int number) {
     return std::count(list.begin(), list.end(), number) > 0;
-}
-
-/// The texts of the output: the source's, where the request has no others.
-std::vector<Tag> TextsFor(const SourceInfo& source, const Request& request) {
-    std::vector<Tag> texts;
-    for (const Tag& tag : source.tags) {
-        const bool replaced = std::any_of(request.metadata.begin(), request.metadata.end(),
-                                          [&](const Tag& wish) { return AreAlike(wish.key, tag.key); });
-        if (!request.noMetadata && !replaced)
-            texts.push_back(tag);
-    }
-    texts.insert(texts.end(), request.metadata.begin(), request.metadata.end());
-    return texts;
-}
-
-/// Returns what the format cannot hold.
-std::vector<NotCarried> CarryTexts(const SourceInfo& source, const Request& request,
-                                   const FileFormatInfo& format, uint32_t set) {
-    std::vector<NotCarried> left;
-    std::vector<std::string> missing;
-    for (const Tag& tag : TextsFor(source, request)) {
-        MWSetTag(set, tag.key.c_str(), tag.value.c_str());
-        if (!tag.value.empty() && MWCarriesTag(format.fccFormat, tag.key.c_str(), tag.value.c_str()) == 0)
-            missing.push_back(tag.key);
-    }
-    if (!missing.empty())
-        left.push_back({"tags",
-                        std::nullopt,
-                        {},
-                        {},
-                        fmt::format("{} cannot hold {}", NameOf(format), Enumerate(missing))});
-    const auto label = [&](int stream, int track) {
-        if (std::optional<NotCarried> lost =
-                LabelTrack(StreamAt(source, stream), request, format, set, track))
-            left.push_back(std::move(*lost));
-    };
-    if (source.pictures && !request.noVideo && format.bHasVideo != 0)
-        label(source.pictures->index, kWriterTrackPictures);
-    if (source.sound && !request.noAudio && !request.copySound && format.bHasAudio != 0)
-        label(source.sound->index, kWriterTrackSound);
-    return left;
 }
 
 int TakeNext(void* context, int64_t until, int closing, WriterTrackItem* item) {
@@ -152,7 +47,7 @@ std::string WhySubtitlesStay(const StreamInfo& stream, const FileFormatInfo& for
     if (MWCarriesPackets(format.fccFormat, stream.codec.c_str()) != 0)
         return {};
     const bool matroskaCan = MWCarriesPackets(kMatroska, stream.codec.c_str()) != 0;
-    return fmt::format("{} cannot hold them{}", NameOf(format), matroskaCan ? ", MKV can" : "");
+    return fmt::format("{} cannot hold them{}", ShortName(format), matroskaCan ? ", MKV can" : "");
 }
 
 /// What `read` gives, with its errors as failures.
@@ -257,53 +152,16 @@ bool BelongTogether(const StreamInfo& one, const StreamInfo& other) {
 std::string WhySoundStays(const SourceInfo& source, const StreamInfo& stream, const FileFormatInfo& format,
                           bool copies) {
     if (format.bHasAudio == 0)
-        return fmt::format("{} cannot hold it", NameOf(format));
+        return fmt::format("{} cannot hold it", ShortName(format));
     if ((MWGetFormatTraits(format.fccFormat) & kWriterFormatTracks) == 0)
-        return fmt::format("{} holds one track of sound, MKV and MP4 hold several", NameOf(format));
+        return fmt::format("{} holds one track of sound, MKV and MP4 hold several", ShortName(format));
     if (!stream.decodable || !stream.sound || stream.sound->sampleRate <= 0 || stream.sound->channels <= 0)
         return "it cannot be decoded";
     if (copies && MWCarriesPackets(format.fccFormat, stream.codec.c_str()) == 0)
-        return fmt::format("{} cannot hold it as it is", NameOf(format));
+        return fmt::format("{} cannot hold it as it is", ShortName(format));
     if (source.pictures && !BelongTogether(StreamAt(source, source.pictures->index), stream))
         return "it belongs to another programme";
     return {};
-}
-
-/// How many chapters were left out, because they make no sense.
-int CarryChapters(const SourceInfo& source, uint32_t set) {
-    int left = 0;
-    for (const Chapter& chapter : source.chapters)
-        left +=
-            MWAddChapter(set, Ticks(chapter.begin), Ticks(chapter.end), chapter.title.c_str()) != 0 ? 0 : 1;
-    return left;
-}
-
-/// Where chapters are texts about the movie: CHAPTER001, CHAPTER001NAME ...
-bool HoldsChapterTexts(const FileFormatInfo& format) {
-    return format.fccFormat == FourCC("OGG ");
-}
-
-/// CarryChapters as texts, of what lies in the one file that the request asks for.
-int CarryChapterTexts(const SourceInfo& source, const Request& request, uint32_t set) {
-    constexpr int kMost = 999;
-    int number = 0;
-    int left = 0;
-    for (const Chapter& chapter : source.chapters) {
-        const double begin = std::max(chapter.begin - request.begin, 0.0);
-        const bool isThere = chapter.end > request.begin && (!request.length || begin < *request.length);
-        if (chapter.end <= chapter.begin || (isThere && number == kMost)) {
-            ++left;
-        } else if (isThere) {
-            const auto milliseconds = std::llround(begin * 1000);
-            const std::string key = fmt::format("CHAPTER{:03}", ++number);
-            MWSetTag(set, key.c_str(),
-                     fmt::format("{:02}:{:02}:{:02}.{:03}", milliseconds / 3'600'000,
-                                 milliseconds / 60'000 % 60, milliseconds / 1000 % 60, milliseconds % 1000)
-                         .c_str());
-            MWSetTag(set, (key + "NAME").c_str(), chapter.title.c_str());
-        }
-    }
-    return left;
 }
 
 bool CarryFile(const Movie& movie, const StreamInfo& stream, uint32_t set) {
@@ -347,13 +205,13 @@ std::string WhyItStays(const SourceInfo& source, const Chosen& chosen, const Str
                                                                          : "data streams are not converted";
     case StreamKind::kCover:
         if ((traits & kWriterFormatCover) == 0)
-            return fmt::format("{} cannot hold it", NameOf(format));
+            return fmt::format("{} cannot hold it", ShortName(format));
         return format.fccFormat == FourCC("FLAC") && stream.bytes > kLargestCoverInFlac
-                   ? fmt::format("{} cannot hold one of {} bytes", NameOf(format), stream.bytes)
+                   ? fmt::format("{} cannot hold one of {} bytes", ShortName(format), stream.bytes)
                    : "";
     case StreamKind::kAttachment:
         return (traits & kWriterFormatAttachments) != 0 ? ""
-                                                        : fmt::format("{} cannot hold it", NameOf(format));
+                                                        : fmt::format("{} cannot hold it", ShortName(format));
     }
     return {};
 }
@@ -370,22 +228,13 @@ std::string CarryStored(const Movie& movie, const StreamInfo& stream, uint32_t s
     return hasCover ? "" : "it is neither JPEG nor PNG";
 }
 
-std::optional<NotCarried> WhyChaptersStay(const SourceInfo& source, const Request& request,
-                                          const FileFormatInfo& format) {
-    const bool can =
-        (MWGetFormatTraits(format.fccFormat) & kWriterFormatChapters) != 0 || HoldsChapterTexts(format);
-    if (can || source.chapters.empty() || request.noChapters)
-        return std::nullopt;
-    return NotCarried{"chapters", std::nullopt, {}, {}, fmt::format("{} cannot hold them", NameOf(format))};
-}
-
 /// What the name of a file of subtitles says of its codec.
 std::string UsualTextCodec(const std::string& path) {
     const std::size_t dot = path.rfind('.');
     const std::string extension = dot == std::string::npos ? "" : path.substr(dot + 1);
-    return AreAlike(extension, "ass") || AreAlike(extension, "ssa") ? "ass"
-           : AreAlike(extension, "vtt")                             ? "webvtt"
-                                                                    : "subrip";
+    return SameIgnoringCase(extension, "ass") || SameIgnoringCase(extension, "ssa") ? "ass"
+           : SameIgnoringCase(extension, "vtt")                                     ? "webvtt"
+                                                                                    : "subrip";
 }
 
 NotCarried LeftOf(const StreamInfo& stream, std::string reason) {
@@ -431,9 +280,7 @@ std::vector<NotCarried> CarryOver(Movie& movie, const Request& request, const Fi
     if (std::optional<NotCarried> chapters = WhyChaptersStay(source, request, format))
         left.push_back(*std::move(chapters));
     else if (!request.noChapters)
-        if (const int wrong = HoldsChapterTexts(format) ? CarryChapterTexts(source, request, writerSet)
-                                                        : CarryChapters(source, writerSet);
-            wrong != 0)
+        if (const int wrong = CarryChapters(source, request, format, writerSet); wrong != 0)
             left.push_back(
                 {"chapters", std::nullopt, {}, {}, fmt::format("{} of them have no length", wrong)});
     FurtherTracks tracks(movie, request, format, writerSet);

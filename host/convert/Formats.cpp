@@ -14,11 +14,6 @@ char Lower(char c) {
     return static_cast<char>(std::tolower(static_cast<unsigned char>(c)));
 }
 
-bool SameIgnoringCase(std::string_view a, std::string_view b) {
-    return std::equal(a.begin(), a.end(), b.begin(), b.end(),
-                      [](char x, char y) { return Lower(x) == Lower(y); });
-}
-
 bool HasExtension(const FileFormatInfo& format, std::string_view extension) {
     std::string_view list = format.szExtensions;
     for (;;) {
@@ -41,6 +36,16 @@ const FileFormatInfo* FindIf(Matches matches) {
 }
 
 } // namespace
+
+bool SameIgnoringCase(std::string_view a, std::string_view b) {
+    return std::equal(a.begin(), a.end(), b.begin(), b.end(),
+                      [](char x, char y) { return Lower(x) == Lower(y); });
+}
+
+std::string ShortName(const FileFormatInfo& format) {
+    const std::string name = format.szName;
+    return name.substr(0, name.find(" ("));
+}
 
 const FileFormatInfo* FindFormat(std::string_view name) {
     const std::optional<uint32_t> code = ParseCode(name);

@@ -17,8 +17,14 @@ const FileFormatInfo* FindFormat(std::string_view name);
 /// The format that the extension of a file name stands for. Null when it has none or an unknown one.
 const FileFormatInfo* FindFormatOfFile(std::string_view path);
 
+/// "MP4" of "MP4 (MPEG-4 Part 14)".
+std::string ShortName(const FileFormatInfo& format);
+
 /// Whether files of the format hold several tracks of sound.
 bool HoldsSeveralTracks(const FileFormatInfo& format);
+
+/// Compares by bytes, ASCII letters in any case.
+bool SameIgnoringCase(std::string_view one, std::string_view other);
 
 /// "H264" from "h264", "AAC " from "aac". Nothing for more than four characters or none.
 std::optional<uint32_t> ParseCode(std::string_view text);

@@ -1,0 +1,166 @@
+#include "host/convert/CarryTexts.h"
+
+#include "host/convert/Formats.h"
+#include "host/source/Languages.h"
+#include "host/source/MediaTime.h"
+#include "media/FourCC.h"
+#include "media/MediaRecords.h"
+#include "writer/WriterStatus.h"
+
+#include <algorithm>
+#include <cmath>
+#include <cstddef>
+#include <fmt/format.h>
+#include <string>
+#include <utility>
+
+namespace movieconv {
+namespace {
+
+int64_t Ticks(double seconds) {
+    return std::llround(seconds * kTicksPerSecond);
+}
+
+int Dispositions(const StreamFlags& flags) {
+    return (flags.isDefault ? AV_DISPOSITION_DEFAULT : 0) | (flags.forced ? AV_DISPOSITION_FORCED : 0) |
+           (flags.original ? AV_DISPOSITION_ORIGINAL : 0) | (flags.dub ? AV_DISPOSITION_DUB : 0) |
+           (flags.commentary ? AV_DISPOSITION_COMMENT : 0) |
+           (flags.hearingImpaired ? AV_DISPOSITION_HEARING_IMPAIRED : 0) |
+           (flags.visualImpaired ? AV_DISPOSITION_VISUAL_IMPAIRED : 0);
+}
+
+/// "a", "a and b", "a, b and c".
+std::string Enumerate(const std::vector<std::string>& names) {
+    std::string text;
+    for (std::size_t i = 0; i < names.size(); ++i)
+        text += (i == 0 ? "" : i + 1 == names.size() ? " and " : ", ") + names[i];
+    return text;
+}
+
+/// The texts of the output: the source's, where the request has no others.
+std::vector<Tag> TextsFor(const SourceInfo& source, const Request& request) {
+    std::vector<Tag> texts;
+    for (const Tag& tag : source.tags) {
+        const bool replaced =
+            std::any_of(request.metadata.begin(), request.metadata.end(),
+                        [&](const Tag& wish) { return SameIgnoringCase(wish.key, tag.key); });
+        if (!request.noMetadata && !replaced)
+            texts.push_back(tag);
+    }
+    texts.insert(texts.end(), request.metadata.begin(), request.metadata.end());
+    return texts;
+}
+
+/// How many chapters were left out, because they make no sense.
+int AddChapters(const SourceInfo& source, uint32_t set) {
+    int left = 0;
+    for (const Chapter& chapter : source.chapters)
+        left +=
+            MWAddChapter(set, Ticks(chapter.begin), Ticks(chapter.end), chapter.title.c_str()) != 0 ? 0 : 1;
+    return left;
+}
+
+/// Where chapters are texts about the movie: CHAPTER001, CHAPTER001NAME ...
+bool HoldsChapterTexts(const FileFormatInfo& format) {
+    return format.fccFormat == FourCC("OGG ");
+}
+
+/// AddChapters as texts, of what lies in the one file that the request asks for.
+int AddChapterTexts(const SourceInfo& source, const Request& request, uint32_t set) {
+    constexpr int kMost = 999;
+    int number = 0;
+    int left = 0;
+    for (const Chapter& chapter : source.chapters) {
+        const double begin = std::max(chapter.begin - request.begin, 0.0);
+        const bool isThere = chapter.end > request.begin && (!request.length || begin < *request.length);
+        if (chapter.end <= chapter.begin || (isThere && number == kMost)) {
+            ++left;
+        } else if (isThere) {
+            const auto milliseconds = std::llround(begin * 1000);
+            const std::string key = fmt::format("CHAPTER{:03}", ++number);
+            MWSetTag(set, key.c_str(),
+                     fmt::format("{:02}:{:02}:{:02}.{:03}", milliseconds / 3'600'000,
+                                 milliseconds / 60'000 % 60, milliseconds / 1000 % 60, milliseconds % 1000)
+                         .c_str());
+            MWSetTag(set, (key + "NAME").c_str(), chapter.title.c_str());
+        }
+    }
+    return left;
+}
+
+} // namespace
+
+std::optional<NotCarried> LabelTrack(const StreamInfo& stream, const Request& request,
+                                     const FileFormatInfo& format, uint32_t set, int track) {
+    std::vector<std::string> missing;
+    const auto carries = [&](const char* key, const std::string& value) {
+        return MWCarriesTrackTag(format.fccFormat, key, value.c_str()) != 0;
+    };
+    if (!stream.language.empty()) {
+        const std::vector<std::string> codes = CodesFor(stream.language);
+        const auto code = std::find_if(codes.begin(), codes.end(),
+                                       [&](const std::string& each) { return carries("language", each); });
+        if (code != codes.end())
+            MWSetTrackTag(set, track, "language", code->c_str());
+        else
+            missing.emplace_back("language");
+    }
+    if (!request.noMetadata && !stream.title.empty()) {
+        MWSetTrackTag(set, track, "title", stream.title.c_str());
+        if (!carries("title", stream.title))
+            missing.emplace_back("title");
+    }
+    const int flags = Dispositions(stream.flags);
+    MWSetTrackFlags(set, track, flags);
+    if ((flags & ~(MWCarriedTrackFlags(format.fccFormat) | AV_DISPOSITION_DEFAULT)) != 0)
+        missing.emplace_back("flags");
+    if (missing.empty())
+        return std::nullopt;
+    return NotCarried{"label", stream.index >= 0 ? std::optional(stream.index) : std::nullopt, stream.codec,
+                      stream.language,
+                      fmt::format("{} cannot hold its {}", ShortName(format), Enumerate(missing))};
+}
+
+std::vector<NotCarried> CarryTexts(const SourceInfo& source, const Request& request,
+                                   const FileFormatInfo& format, uint32_t set) {
+    std::vector<NotCarried> left;
+    std::vector<std::string> missing;
+    for (const Tag& tag : TextsFor(source, request)) {
+        MWSetTag(set, tag.key.c_str(), tag.value.c_str());
+        if (!tag.value.empty() && MWCarriesTag(format.fccFormat, tag.key.c_str(), tag.value.c_str()) == 0)
+            missing.push_back(tag.key);
+    }
+    if (!missing.empty())
+        left.push_back({"tags",
+                        std::nullopt,
+                        {},
+                        {},
+                        fmt::format("{} cannot hold {}", ShortName(format), Enumerate(missing))});
+    const auto label = [&](int stream, int track) {
+        if (std::optional<NotCarried> lost =
+                LabelTrack(source.streams[static_cast<std::size_t>(stream)], request, format, set, track))
+            left.push_back(std::move(*lost));
+    };
+    if (source.pictures && !request.noVideo && format.bHasVideo != 0)
+        label(source.pictures->index, kWriterTrackPictures);
+    if (source.sound && !request.noAudio && !request.copySound && format.bHasAudio != 0)
+        label(source.sound->index, kWriterTrackSound);
+    return left;
+}
+
+int CarryChapters(const SourceInfo& source, const Request& request, const FileFormatInfo& format,
+                  uint32_t set) {
+    return HoldsChapterTexts(format) ? AddChapterTexts(source, request, set) : AddChapters(source, set);
+}
+
+std::optional<NotCarried> WhyChaptersStay(const SourceInfo& source, const Request& request,
+                                          const FileFormatInfo& format) {
+    const bool can =
+        (MWGetFormatTraits(format.fccFormat) & kWriterFormatChapters) != 0 || HoldsChapterTexts(format);
+    if (can || source.chapters.empty() || request.noChapters)
+        return std::nullopt;
+    return NotCarried{
+        "chapters", std::nullopt, {}, {}, fmt::format("{} cannot hold them", ShortName(format))};
+}
+
+} // namespace movieconv

@@ -1,0 +1,37 @@
+// What is said of a movie and its tracks: texts, languages, titles, flags and chapters, handed to the writer,
+// or told.
+#ifndef MOVIECONV_HOST_CONVERT_CARRYTEXTS_H
+#define MOVIECONV_HOST_CONVERT_CARRYTEXTS_H
+
+#include "host/convert/Observer.h"
+#include "host/convert/Request.h"
+#include "host/source/SourceInfo.h"
+#include "media/EncodeParam.h"
+
+#include <cstdint>
+#include <optional>
+#include <vector>
+
+namespace movieconv {
+
+/// Gives the writer's set the texts about the movie and what the engine's tracks are called. Returns what the
+/// format cannot hold.
+std::vector<NotCarried> CarryTexts(const SourceInfo& source, const Request& request,
+                                   const FileFormatInfo& format, uint32_t set);
+
+/// Says what a track of the writer's set is, as far as the format can. Returns what it cannot.
+std::optional<NotCarried> LabelTrack(const StreamInfo& stream, const Request& request,
+                                     const FileFormatInfo& format, uint32_t set, int track);
+
+/// Gives the writer's set the chapters, for a format that holds some. Returns how many were left out, because
+/// they make no sense.
+int CarryChapters(const SourceInfo& source, const Request& request, const FileFormatInfo& format,
+                  uint32_t set);
+
+/// Nothing when there are none, none are wanted, or the format holds them.
+std::optional<NotCarried> WhyChaptersStay(const SourceInfo& source, const Request& request,
+                                          const FileFormatInfo& format);
+
+} // namespace movieconv
+
+#endif
