@@ -3,6 +3,7 @@
 #include "host/convert/CarryTexts.h"
 #include "host/convert/CodecPlan.h"
 #include "host/convert/Formats.h"
+#include "host/source/Languages.h"
 #include "host/source/MediaTime.h"
 #include "host/source/SourceError.h"
 #include "host/source/StreamChoice.h"
