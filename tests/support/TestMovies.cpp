@@ -5,22 +5,32 @@
 
 #include <filesystem>
 #include <fmt/format.h>
+#include <functional>
+#include <system_error>
 #include <unistd.h>
 
 namespace test_movies {
 
 std::string Make(const std::string& name, const Args& arguments) {
     namespace fs = std::filesystem;
-    const fs::path folder = MOVIECONV_TEST_MOVIES;
+    std::string all;
+    for (const std::string& argument : arguments)
+        all += argument + '\n';
+    // A folder for each way of making: tests of different files may give theirs one name.
+    const fs::path folder =
+        fs::path(MOVIECONV_TEST_MOVIES) / fmt::format("{:x}", std::hash<std::string>()(all));
     const fs::path path = folder / name;
     if (!fs::exists(path)) {
         fs::create_directories(folder);
-        // Tests run in parallel: each makes its own and the last one stays.
+        // Tests run in parallel: each makes its own and the first one stays, since a test may be using it.
         const fs::path mine = folder / fmt::format("{}-{}", getpid(), name);
         const program::Result result = program::Run(
             Join(Args{"ffmpeg", "-v", "error", "-nostdin", "-y"}, arguments, Args{mine.string()}));
         EXPECT_EQ(result.code, 0) << "ffmpeg could not make " << name << ": " << result.err;
-        fs::rename(mine, path);
+        std::error_code isThere;
+        fs::create_hard_link(mine, path, isThere);
+        fs::remove(mine);
+        EXPECT_TRUE(fs::exists(path)) << isThere.message();
     }
     return path.string();
 }
