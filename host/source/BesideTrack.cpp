@@ -167,7 +167,8 @@ void BesidePackets::Hold(av::Packet packet) {
     if (stamp != AV_NOPTS_VALUE) {
         held.begin = clock_(stamp, timeBase_);
         const bool isLasting = av_rescale_q(held.packet->duration, timeBase_, {1, 1}) >= kLongest;
-        held.end = clock_(stamp + (isLasting ? 0 : std::max<int64_t>(held.packet->duration, 0)), timeBase_);
+        const int64_t duration = isLasting ? 0 : std::max<int64_t>(held.packet->duration, 0);
+        held.end = clock_(av_sat_add64(stamp, duration), timeBase_); // stamps are whatever the file says
     }
     latest_ = std::max(latest_, held.begin);
     if (held.Ends() && held.end <= fileBegin_)
