@@ -71,8 +71,15 @@ bool AddTrack(Extras& extras, const WriterTrack* track) {
     const bool isSound = track->nSampleRate > 0 && track->nChannels > 0 && track->nBitsPerSample > 0;
     if (isSound == (track->pParameters != nullptr))
         return false;
-    Track made{{}, track->nSampleRate, track->nChannels, track->nBitsPerSample, track->nBitrate,
-               {}, track->pfnNext,     track->pContext};
+    Track made{{},
+               track->nSampleRate,
+               track->nChannels,
+               track->nBitsPerSample,
+               track->nBitrate,
+               {},
+               track->pfnNext,
+               track->pContext,
+               std::make_shared<std::atomic<int64_t>>(0)};
     if (!isSound) {
         made.parameters =
             std::shared_ptr<AVCodecParameters>(avcodec_parameters_alloc(), av::CodecParametersFree());

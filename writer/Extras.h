@@ -5,6 +5,7 @@
 #include "ffmpeg/AvHandles.h"
 #include "writer/WriterStatus.h"
 
+#include <atomic>
 #include <cstdint>
 #include <map>
 #include <memory>
@@ -39,6 +40,12 @@ struct Attachment {
 struct TrackLabel {
     Tags tags;
     int flags = 0; ///< FFmpeg's AV_DISPOSITION_...
+
+    /// "" without such a text.
+    std::string Text(const char* key) const {
+        const auto found = tags.find(key);
+        return found != tags.end() ? found->second : std::string();
+    }
 };
 
 /// A track beside the engine's; see WriterTrack.
@@ -51,6 +58,7 @@ struct Track {
     std::shared_ptr<AVCodecParameters> parameters; ///< Of packets.
     WriterTrackReader next = nullptr;
     void* context = nullptr;
+    std::shared_ptr<std::atomic<int64_t>> lostCues; ///< In all files that it went into.
 };
 
 /// Whether its packets are sound.

@@ -110,12 +110,6 @@ constexpr const char* kRiffTags = "title,artist,album,comment,copyright,date,gen
 constexpr const char* kServiceTags = "title,service_name,service_provider";
 constexpr const char* kAnyTags = nullptr;
 constexpr const char* kNoTags = "";
-// QuickTime numbers these; the names are the multiplexer's.
-constexpr const char* kMovLanguages =
-    "eng,fra,ger,ita,dut,sve,spa,dan,por,nor,heb,jpn,ara,fin,gre,ice,mlt,tur,hr ,chi,urd,hin,tha,kor,lit,pol,hun,est,"
-    "lav,fo ,rus,iri,alb,ron,ces,slk,slv,yid,sr ,mac,bul,ukr,bel,uzb,kaz,aze,arm,geo,mol,kir,tgk,tuk,mon,pus,kur,kas,"
-    "snd,tib,nep,san,mar,ben,asm,guj,pa ,ori,mal,kan,tam,tel,bur,khm,lao,vie,ind,tgl,may,amh,tir,orm,som,swa,kin,run,"
-    "nya,mlg,epo,wel,baq,cat,lat,que,grn,aym,tat,uig,dzo,jav";
 constexpr int kNoFlags = 0;
 constexpr int kSenses = AV_DISPOSITION_HEARING_IMPAIRED | AV_DISPOSITION_VISUAL_IMPAIRED;
 constexpr int kMp4Flags = AV_DISPOSITION_FORCED | AV_DISPOSITION_COMMENT | AV_DISPOSITION_DUB | kSenses;
@@ -342,10 +336,11 @@ bool CarriesTag(const Container& container, const std::string& key, const std::s
 bool CarriesTrackTag(const Container& container, const std::string& key, const std::string& value) {
     if (key == "title")
         return (container.carries & kTitles) != 0;
+    if (key == "language_tag")
+        return container.kind == kFragmented || container.code == FourCC("MKV ") ||
+               container.code == FourCC("WEBM");
     if (key != "language" || (container.carries & kLanguages) == 0)
         return false;
-    if (container.code == FourCC("MOV "))
-        return IsListed(kMovLanguages, value);
     constexpr size_t kLetters = 3;
     return container.tags == nullptr ||
            (value.size() == kLetters && std::all_of(value.begin(), value.end(), [](char letter) {

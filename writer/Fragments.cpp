@@ -194,7 +194,7 @@ void FinishFragments(const std::shared_ptr<ByteFile>& part, const PacketWriter& 
     if (static_cast<int>(input->nb_streams) != written.StreamCount())
         ThrowIncomplete();
     const auto makeIndex = [&](int64_t place) {
-        Mp4Index index(container, bitExact, extras);
+        Mp4Index index(container, bitExact, extras, place);
         AddStreams(*input, written, index);
         const TextRows texts = AddTexts(log, written, end, index);
         log.ForEach([&](const PlacedPacket& packet) {
@@ -209,7 +209,7 @@ void FinishFragments(const std::shared_ptr<ByteFile>& part, const PacketWriter& 
             if ((IsText(written, stream) ? texts.Texts(stream) : index.Packets(stream)) !=
                 written.Stream(stream).packets)
                 ThrowIncomplete();
-        return index.Finish(place);
+        return index.Finish();
     };
     room.Finish(*part, makeIndex, Mp4Index::MostTexts(extras),
                 [&written](ByteFile& plain) { CheckIndex(plain, written); });

@@ -240,6 +240,19 @@ int MWAddTrack(uint32_t set, const WriterTrack* track) {
     return ChangeExtras(set, [&](Extras& extras) { return writer::AddTrack(extras, track); });
 }
 
+int64_t MWGetLostCues(uint32_t set, int track) {
+    return Guarded<int64_t>(0, [&]() -> int64_t {
+        const std::shared_ptr<OptionSet> found = OptionSets::Instance().Find(set);
+        const int further = track - kWriterTrackFurther;
+        if (!found || further < 0)
+            return 0;
+        const std::vector<writer::Track>& tracks = found->ExtraParts()->tracks;
+        return further < static_cast<int>(tracks.size())
+                   ? tracks[static_cast<std::size_t>(further)].lostCues->load()
+                   : 0;
+    });
+}
+
 int MWCarriesPackets(uint32_t format, const char* codec) {
     return Guarded(0, [&] {
         const writer::Container* container = writer::FindContainer(format);

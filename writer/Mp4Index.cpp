@@ -33,6 +33,10 @@ size_t FindMoov(const std::vector<uint8_t>& kept) {
     throw WriterFailure(kWriterErrorEncode, "The container has no index.");
 }
 
+bool HasTimecode(const Extras& extras) {
+    return extras.pictures.tags.count("timecode") != 0;
+}
+
 } // namespace
 
 /// Drops what is written to it, but for the end.
@@ -72,8 +76,9 @@ private:
     std::vector<uint8_t> kept_;
 };
 
-Mp4Index::Mp4Index(const Container& container, bool bitExact, const Extras& extras)
+Mp4Index::Mp4Index(const Container& container, bool bitExact, const Extras& extras, int64_t place)
     : extras_(extras),
+      place_(place),
       sink_(std::make_shared<Sink>()),
       file_(sink_, AvioFile::Mode::kWrite),
       muxer_(container, file_, false, bitExact, extras),
@@ -85,8 +90,10 @@ Mp4Index::~Mp4Index() = default;
 
 int64_t Mp4Index::MostTexts(const Extras& extras) {
     constexpr int64_t kPerText = 64;
+    constexpr int64_t kHead = 256;
     // The multiplexer ends the texts of each track with an empty one.
-    const auto ends = static_cast<int64_t>(extras.tracks.size()) * kPerText;
+    const auto ends =
+        static_cast<int64_t>(extras.tracks.size()) * kPerText + (HasTimecode(extras) ? kHead : 0);
     return std::accumulate(extras.chapters.begin(), extras.chapters.end(), ends,
                            [](int64_t sum, const Chapter& chapter) {
                                return sum + kPerText + static_cast<int64_t>(chapter.title.size());
@@ -96,8 +103,10 @@ int64_t Mp4Index::MostTexts(const Extras& extras) {
 int64_t Mp4Index::MostOf(const Extras& extras) {
     constexpr int64_t kPerTag = 64;
     constexpr int64_t kChapterTrack = 2048;
+    constexpr int64_t kTimecodeTrack = 1024;
     // In the texts, in the list, and in the tables of their track.
-    int64_t size = 3 * MostTexts(extras) + (extras.chapters.empty() ? 0 : kChapterTrack);
+    int64_t size = 3 * MostTexts(extras) + (extras.chapters.empty() ? 0 : kChapterTrack) +
+                   (HasTimecode(extras) ? kTimecodeTrack : 0);
     std::vector<const Tags*> all{&extras.tags, &extras.pictures.tags, &extras.sound.tags};
     for (const Track& track : extras.tracks)
         all.push_back(&track.label.tags);
@@ -109,6 +118,9 @@ int64_t Mp4Index::MostOf(const Extras& extras) {
 
 void Mp4Index::AddStream(const MuxedStream& stream, int64_t delay) {
     muxer_.AddStream(stream);
+    tracks_.push_back({stream.label->Text("language"), stream.label->Text("language_tag"),
+                       stream.parameters->codec_type == AVMEDIA_TYPE_SUBTITLE &&
+                           (stream.label->flags & AV_DISPOSITION_DEFAULT) == 0});
     streams_.push_back(
         {stream.unit, delay, stream.parameters->codec_id, stream.carriage->describedByPacket, {}});
 }
@@ -116,7 +128,18 @@ void Mp4Index::AddStream(const MuxedStream& stream, int64_t delay) {
 void Mp4Index::Begin() {
     if (std::exchange(begun_, true))
         return;
+    // The timecode is a packet of the multiplexer's own, behind its head.
+    if (HasTimecode(extras_)) {
+        avio_seek(file_.Io(), place_, SEEK_SET);
+        sink_->KeepFrom(place_);
+    }
     muxer_.WriteHeader(0);
+    if (HasTimecode(extras_)) {
+        if (file_.Flush() != 0)
+            throw std::bad_alloc();
+        head_ = std::exchange(sink_->Kept(), {});
+        sink_->KeepFrom(-1);
+    }
     for (size_t stream = 0; stream < streams_.size(); ++stream)
         streams_[stream].muxedUnit = muxer_.Stream(static_cast<int>(stream)).description.unit;
 }
@@ -154,9 +177,10 @@ void Mp4Index::Add(const PlacedPacket& placed, const std::vector<uint8_t>& conte
     ++stream.packets;
 }
 
-Mp4Index::Result Mp4Index::Finish(int64_t place) {
+Mp4Index::Result Mp4Index::Finish() {
     Begin();
     file_.Flush();
+    const int64_t place = place_ + static_cast<int64_t>(head_.size());
     avio_seek(file_.Io(), place, SEEK_SET);
     sink_->KeepFrom(place);
     // Only now, so that their texts come here.
@@ -167,8 +191,10 @@ Mp4Index::Result Mp4Index::Finish(int64_t place) {
     std::vector<uint8_t>& kept = sink_->Kept();
     const size_t moov = FindMoov(kept);
     Result result{{}, std::vector<uint8_t>(kept.begin() + static_cast<std::ptrdiff_t>(moov), kept.end())};
+    CorrectTracks(result.moov, tracks_);
     kept.resize(moov);
-    result.texts = std::move(kept);
+    result.texts = std::move(head_);
+    result.texts.insert(result.texts.end(), kept.begin(), kept.end());
     return result;
 }
 

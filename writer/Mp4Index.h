@@ -7,6 +7,7 @@
 #include "writer/AvioFile.h"
 #include "writer/Extras.h"
 #include "writer/FragmentLog.h"
+#include "writer/Mp4Tracks.h"
 #include "writer/Muxer.h"
 
 #include <cstdint>
@@ -20,13 +21,15 @@ namespace writer {
 /// std::bad_alloc.
 class Mp4Index {
 public:
-    /// `extras` outlives it; its chapters are on the file's timeline.
-    Mp4Index(const Container& container, bool bitExact, const Extras& extras);
+    /// `extras` outlives it; its chapters are on the file's timeline. `place`: where in the file the texts
+    /// go.
+    Mp4Index(const Container& container, bool bitExact, const Extras& extras, int64_t place);
     Mp4Index(const Mp4Index&) = delete;
     Mp4Index& operator=(const Mp4Index&) = delete;
     ~Mp4Index();
 
-    /// The most bytes that the texts of the chapters take, and that all of it takes in index and texts.
+    /// The most bytes that the texts take, which are the timecode and the titles of the chapters, and that
+    /// all of it takes in index and texts.
     static int64_t MostTexts(const Extras& extras);
     static int64_t MostOf(const Extras& extras);
 
@@ -39,12 +42,12 @@ public:
     /// `content`: the packet's first bytes, or none.
     void Add(const PlacedPacket& packet, const std::vector<uint8_t>& content = {});
 
-    /// The index, and the texts of the chapters, which belong at `place` in the file.
+    /// The index, and the texts that it names.
     struct Result {
         std::vector<uint8_t> texts;
         std::vector<uint8_t> moov;
     };
-    Result Finish(int64_t place);
+    Result Finish();
 
     /// Packets that a stream has got.
     int64_t Packets(int stream) const { return streams_[static_cast<size_t>(stream)].packets; }
@@ -65,12 +68,15 @@ private:
     void Begin();
 
     const Extras& extras_;
+    const int64_t place_;
     const std::shared_ptr<Sink> sink_;
     AvioFile file_;
     Muxer muxer_;
     av::Packet packet_;
     std::vector<Stream> streams_;
+    std::vector<Mp4Track> tracks_;
     std::vector<uint8_t> content_; ///< What stands in for a packet's.
+    std::vector<uint8_t> head_;    ///< What the multiplexer writes before all packets, with the timecode.
     bool begun_ = false;
 };
 

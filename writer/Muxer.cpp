@@ -3,6 +3,7 @@
 #include "media/FourCC.h"
 #include "media/MediaRecords.h"
 #include "thread/Stall.h"
+#include "writer/MatroskaLanguages.h"
 #include "writer/WriterFailure.h"
 #include "writer/WriterStatus.h"
 
@@ -12,6 +13,7 @@ extern "C" {
 }
 
 #include <algorithm>
+#include <cstring>
 #include <iterator>
 #include <new>
 #include <string>
@@ -83,6 +85,7 @@ void SetFragments(AVFormatContext& output, bool describedByPacket, int64_t room)
     // Times are written as they are, from the first fragment on.
     std::string flags = "empty_moov+default_base_moof+frag_discont";
     SetOption(output, "use_editlist", "0");
+    SetOption(output, "write_tmcd", "0"); // comes with the index
     SetOption(output, "avoid_negative_ts", "disabled");
     if (HasPictures(output)) {
         flags += "+frag_keyframe";
@@ -118,7 +121,10 @@ int Muxer::AddStream(const MuxedStream& stream) {
         throw std::bad_alloc();
     Check(avcodec_parameters_copy(made->codecpar, stream.parameters), "does not take a stream");
     if (Carries(kWriterFormatTags)) {
-        SetTags(made->metadata, stream.label->tags);
+        Tags tags = stream.label->tags;
+        if (tags.erase("language_tag") != 0 && IsMatroska())
+            tags["language"] = LanguagePlace(*stream.label);
+        SetTags(made->metadata, tags);
         if (container_.tagsInStream)
             SetTags(made->metadata, TagsFor(container_, extras_.tags));
     }
@@ -142,9 +148,26 @@ void Muxer::WriteHeader(int64_t room) {
         AddCover();
     Check(avformat_write_header(output_.get(), nullptr), "refuses its header");
     WriteCover();
+    SetLanguageTags();
     NoteWhole();
     if (fragmented_)
         SetDelays();
+}
+
+bool Muxer::IsMatroska() const {
+    return std::strcmp(container_.muxer, "matroska") == 0 || std::strcmp(container_.muxer, "webm") == 0;
+}
+
+/// The multiplexer writes the tracks with the header, and once more at the end.
+void Muxer::SetLanguageTags() {
+    std::vector<const TrackLabel*> labels;
+    for (const State& stream : streams_)
+        if (!stream.label->Text("language_tag").empty())
+            labels.push_back(stream.label);
+    if (labels.empty() || !IsMatroska() || file_.Flush() != 0)
+        return;
+    if (const int error = PutLanguageTags(*file_.File(), labels); error != 0)
+        throw SystemFailure(kWriterErrorWrite, error, "The languages could not be written");
 }
 
 /// One by one: avformat_write_header ignores it when it has no memory for one.
@@ -362,6 +385,7 @@ void Muxer::WriteTrailer() {
     if (std::exchange(ended_, true))
         return;
     Check(av_write_trailer(output_.get()), "cannot be finished");
+    SetLanguageTags();
     finished_ = true;
 }
 

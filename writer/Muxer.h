@@ -94,6 +94,8 @@ private:
     int64_t LeastLag() const;
     void NoteWhole();
     void FlushNowAndThen(int64_t time);
+    bool IsMatroska() const;
+    void SetLanguageTags();
 
     const Container& container_;
     AvioFile& file_;

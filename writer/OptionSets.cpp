@@ -52,6 +52,11 @@ WriterOptions OptionSet::Options() const {
     return options_;
 }
 
+std::shared_ptr<const Extras> OptionSet::ExtraParts() const {
+    const std::lock_guard lock(mutex_);
+    return extras_;
+}
+
 std::shared_ptr<FileRecord> OptionSet::Open(std::string_view path) {
     const std::lock_guard lock(mutex_);
     auto record = std::make_shared<FileRecord>(number_, count_ + 1, path, options_, extras_);

@@ -44,6 +44,9 @@ public:
         return true;
     }
 
+    /// What files carry that are opened from now on.
+    std::shared_ptr<const Extras> ExtraParts() const;
+
     /// Gives the next number of this set to a file named `path`.
     std::shared_ptr<FileRecord> Open(std::string_view path);
 

@@ -294,7 +294,8 @@ private:
         return at == std::string::npos ? std::string() : event.substr(at + 1);
     }
 
-    static void Drop(const char* what, int error) {
+    void Drop(const char* what, int error) {
+        ++*track_.lostCues;
         WriteLog(kLogWarning, "A subtitle could not be %s: %s.", what, av::ErrorText(error).c_str());
     }
 

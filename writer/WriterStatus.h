@@ -259,7 +259,8 @@ int MWCarriesTag(uint32_t format, const char* key, const char* value);
 /// Numbers of tracks: the engine's pictures, its sound, and from there on those that are added.
 enum { kWriterTrackPictures = 0, kWriterTrackSound = 1, kWriterTrackFurther = 2 };
 
-/// The same about a track, such as "language" (ISO 639-2) or "title".
+/// The same about a track, such as "language" (ISO 639-2), "title", or "language_tag" (BCP 47 with a region
+/// or a script, "pt-BR") beside the language.
 int MWSetTrackTag(uint32_t set, int track, const char* key, const char* value);
 
 /// 1 when files of the format hold that text about a track: a format can have names of its own for some
@@ -313,6 +314,10 @@ typedef struct WriterTrack {
 /// Adds a track. Its number is the next one from kWriterTrackFurther on. Formats without kWriterFormatTracks
 /// leave out sound, formats that do not carry the codec (MWCarriesPackets) packets.
 int MWAddTrack(uint32_t set, const WriterTrack* track);
+
+/// Texts of a track of subtitles that were not fit to be converted, and are in none of the set's files. 0
+/// without such a track.
+int64_t MWGetLostCues(uint32_t set, int track);
 
 /// 1 when files of the format carry packets of the codec with that name of FFmpeg's as a track: sound and
 /// subtitles as they are, or subtitles of text as other ones. Else 0.

@@ -3,6 +3,7 @@
 #include "host/convert/CarryTexts.h"
 #include "host/convert/CodecPlan.h"
 #include "host/convert/Formats.h"
+#include "host/convert/Timecode.h"
 #include "host/source/Languages.h"
 #include "host/source/MediaTime.h"
 #include "host/source/SourceError.h"
@@ -109,23 +110,22 @@ public:
     }
 
     /// Hands them to the writer: only now, since what is copied is described by its first packets.
-    void Finish() {
+    void Finish(Carried& carried) {
         int number = kWriterTrackFurther;
         for (Track& each : tracks_) {
             if (each.copied != nullptr)
                 each.track.pParameters = &OpenedBeside(
                     [&]() -> const AVCodecParameters& { return movie_.DescribeCopied(*each.copied); });
+            if (each.stream.kind == StreamKind::kSubtitles)
+                carried.subtitles.push_back({number, each.stream});
             each.track.pfnNext = TakeNext;
             each.track.pContext = each.source;
             if (MWAddTrack(set_, &each.track) == 0)
                 throw std::bad_alloc();
             if (std::optional<NotCarried> lost = LabelTrack(each.stream, request_, format_, set_, number++))
-                lost_.push_back(std::move(*lost));
+                carried.left.push_back(std::move(*lost));
         }
     }
-
-    /// What the format cannot say of those that were added.
-    const std::vector<NotCarried>& Lost() const { return lost_; }
 
 private:
     struct Track {
@@ -140,7 +140,6 @@ private:
     const FileFormatInfo& format_;
     const uint32_t set_;
     std::vector<Track> tracks_;
-    std::vector<NotCarried> lost_;
 };
 
 bool BelongTogether(const StreamInfo& one, const StreamInfo& other) {
@@ -202,8 +201,9 @@ std::string WhyItStays(const SourceInfo& source, const Chosen& chosen, const Str
     case StreamKind::kSubtitles:
         return WhySubtitlesStay(stream, format);
     case StreamKind::kData:
-        return stream.codec == kChapterTrack && !source.chapters.empty() ? ""
-                                                                         : "data streams are not converted";
+        return (stream.codec == kChapterTrack && !source.chapters.empty()) || HoldsTheTimecode(source, stream)
+                   ? ""
+                   : "data streams are not converted";
     case StreamKind::kCover:
         if ((traits & kWriterFormatCover) == 0)
             return fmt::format("{} cannot hold it", ShortName(format));
@@ -238,9 +238,14 @@ std::string UsualTextCodec(const std::string& path) {
                                                                                     : "subrip";
 }
 
+/// Nothing for subtitles of a file of their own.
+std::optional<int> NumberOf(const StreamInfo& stream) {
+    return stream.index >= 0 ? std::optional(stream.index) : std::nullopt;
+}
+
 NotCarried LeftOf(const StreamInfo& stream, std::string reason) {
     const std::string& what = stream.codec == "none" ? stream.fileName : stream.codec;
-    return {std::string(KindName(stream.kind)), stream.index, what, stream.language, std::move(reason)};
+    return {std::string(KindName(stream.kind)), NumberOf(stream), what, stream.language, std::move(reason)};
 }
 
 /// Without what is drawn into the pictures, unless it is asked for by name.
@@ -274,16 +279,18 @@ std::vector<int> FurtherSound(const SourceInfo& source, const Request& request,
     return further;
 }
 
-std::vector<NotCarried> CarryOver(Movie& movie, const Request& request, const FileFormatInfo& format,
-                                  uint32_t writerSet) {
+Carried CarryOver(Movie& movie, const Request& request, const FileFormatInfo& format, uint32_t writerSet) {
     const SourceInfo& source = movie.Info();
-    std::vector<NotCarried> left = CarryTexts(source, request, format, writerSet);
+    Carried carried{{}, CarryTexts(source, request, format, writerSet)};
+    std::vector<NotCarried>& left = carried.left;
     if (std::optional<NotCarried> chapters = WhyChaptersStay(source, request, format))
         left.push_back(*std::move(chapters));
     else if (!request.noChapters)
         if (const int wrong = CarryChapters(source, request, format, writerSet); wrong != 0)
             left.push_back(
                 {"chapters", std::nullopt, {}, {}, fmt::format("{} of them have no length", wrong)});
+    if (std::optional<NotCarried> timecode = WhyTimecodeStays(source, request, format))
+        left.push_back(*std::move(timecode));
     FurtherTracks tracks(movie, request, format, writerSet);
     if (request.copySound && source.sound && format.bHasAudio != 0)
         tracks.AddSound(StreamAt(source, source.sound->index));
@@ -296,8 +303,7 @@ std::vector<NotCarried> CarryOver(Movie& movie, const Request& request, const Fi
     for (const SubtitleFileWish& wish : request.subtitleFiles)
         if (std::optional<NotCarried> stays = tracks.AddFile(wish, request.subtitleCharset))
             left.push_back(std::move(*stays));
-    tracks.Finish();
-    left.insert(left.end(), tracks.Lost().begin(), tracks.Lost().end());
+    tracks.Finish(carried);
     bool hasCover = false;
     for (const StreamInfo& stream : source.streams) {
         if (!chosen.Wants(stream))
@@ -308,7 +314,17 @@ std::vector<NotCarried> CarryOver(Movie& movie, const Request& request, const Fi
         if (!reason.empty())
             left.push_back(LeftOf(stream, std::move(reason)));
     }
-    return left;
+    return carried;
+}
+
+std::vector<NotCarried> LostCues(const std::vector<Carried::Subtitles>& subtitles, uint32_t writerSet) {
+    std::vector<NotCarried> lost;
+    for (const auto& [track, stream] : subtitles)
+        if (const int64_t count = MWGetLostCues(writerSet, track); count > 0)
+            lost.push_back(
+                LeftOf(stream, count == 1 ? "one of their texts could not be converted"
+                                          : fmt::format("{} of their texts could not be converted", count)));
+    return lost;
 }
 
 std::vector<NotCarried> ForetellLeftBehind(const SourceInfo& source, const Request& request,
@@ -325,6 +341,8 @@ std::vector<NotCarried> ForetellLeftBehind(const SourceInfo& source, const Reque
         std::vector<NotCarried> left;
         if (std::optional<NotCarried> chapters = WhyChaptersStay(source, request, format))
             left.push_back(*std::move(chapters));
+        if (std::optional<NotCarried> timecode = WhyTimecodeStays(source, request, format))
+            left.push_back(*std::move(timecode));
         for (const StreamInfo& stream : source.streams)
             if (chosen.Wants(stream))
                 if (std::string reason = WhyItStays(source, chosen, stream, format, request.copySound);

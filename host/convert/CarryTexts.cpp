@@ -1,6 +1,7 @@
 #include "host/convert/CarryTexts.h"
 
 #include "host/convert/Formats.h"
+#include "host/convert/Timecode.h"
 #include "host/source/Languages.h"
 #include "host/source/MediaTime.h"
 #include "media/FourCC.h"
@@ -12,6 +13,7 @@
 #include <cstddef>
 #include <fmt/format.h>
 #include <string>
+#include <string_view>
 #include <utility>
 
 namespace movieconv {
@@ -37,7 +39,7 @@ std::string Enumerate(const std::vector<std::string>& names) {
     return text;
 }
 
-/// The texts of the output: the source's, where the request has no others.
+/// The texts of the output: the source's, where the request has no others. A timecode is none of them.
 std::vector<Tag> TextsFor(const SourceInfo& source, const Request& request) {
     std::vector<Tag> texts;
     for (const Tag& tag : source.tags) {
@@ -48,6 +50,9 @@ std::vector<Tag> TextsFor(const SourceInfo& source, const Request& request) {
             texts.push_back(tag);
     }
     texts.insert(texts.end(), request.metadata.begin(), request.metadata.end());
+    texts.erase(
+        std::remove_if(texts.begin(), texts.end(), [](const Tag& tag) { return IsTimecode(tag.key); }),
+        texts.end());
     return texts;
 }
 
@@ -93,8 +98,11 @@ int AddChapterTexts(const SourceInfo& source, const Request& request, uint32_t s
 std::optional<NotCarried> LabelTrack(const StreamInfo& stream, const Request& request,
                                      const FileFormatInfo& format, uint32_t set, int track) {
     std::vector<std::string> missing;
-    const auto carries = [&](const char* key, const std::string& value) {
-        return MWCarriesTrackTag(format.fccFormat, key, value.c_str()) != 0;
+    // Transport streams tell the language of sound and subtitles only.
+    const bool hasLanguage = track != kWriterTrackPictures || format.fccFormat != FourCC("TS  ");
+    const auto carries = [&](std::string_view key, const std::string& value) {
+        return (hasLanguage || key != "language") &&
+               MWCarriesTrackTag(format.fccFormat, key.data(), value.c_str()) != 0;
     };
     if (!stream.language.empty()) {
         const std::vector<std::string> codes = CodesFor(stream.language);
@@ -104,6 +112,11 @@ std::optional<NotCarried> LabelTrack(const StreamInfo& stream, const Request& re
             MWSetTrackTag(set, track, "language", code->c_str());
         else
             missing.emplace_back("language");
+    }
+    if (!stream.languageTag.empty()) {
+        MWSetTrackTag(set, track, "language_tag", stream.languageTag.c_str());
+        if (!carries("language_tag", stream.languageTag) && missing.empty())
+            missing.push_back(fmt::format("language as {}", stream.languageTag));
     }
     if (!request.noMetadata && !stream.title.empty()) {
         MWSetTrackTag(set, track, "title", stream.title.c_str());

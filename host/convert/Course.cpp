@@ -1,12 +1,12 @@
 #include "host/convert/Course.h"
 
 #include "host/convert/Amounts.h"
-#include "host/convert/CarryOver.h"
 #include "host/convert/CodecPlan.h"
 #include "host/convert/EncodePlan.h"
 #include "host/convert/Judgement.h"
 #include "host/convert/Room.h"
 #include "host/convert/SizePlan.h"
+#include "host/convert/Timecode.h"
 #include "host/source/MediaTime.h"
 #include "text/FileNames.h"
 #include "text/Path.h"
@@ -78,7 +78,9 @@ Verdict Course::Run() {
     const bool lengthKnown = movie_.Info().certainty != Certainty::kGuessed;
     observer_.Started({request_.input, request_.output, length_, lengthKnown});
     if (!request_.piece || !request_.piece->pictures) {
-        for (const NotCarried& left : CarryOver(movie_, request_, ChooseFormat(request_), watch_.OptionSet()))
+        Carried carried = CarryOver(movie_, request_, ChooseFormat(request_), watch_.OptionSet());
+        subtitles_ = std::move(carried.subtitles);
+        for (const NotCarried& left : carried.left)
             if (!request_.piece) // who joins the pieces tells it
                 observer_.LeftBehind(left);
     }
@@ -108,6 +110,9 @@ void Course::RunClip() {
 
 /// One file: all of an output that is not split.
 void Course::RunEngine(double begin, double length) {
+    if (!request_.piece) // its file is not written here
+        CarryTimecode(movie_.Info(), request_, ChooseFormat(request_), watch_.OptionSet(),
+                      ToSeconds(clips_.Begin()));
     if (request_.split) {
         files_.BeginsAt(clips_.Begin());
         const std::string clip =
@@ -340,6 +345,8 @@ Verdict Course::Conclude() {
         wishes_.pictures.OfferLast(*last); // the engine shows but some
     Show();
     ReportComplaints();
+    for (const NotCarried& lost : LostCues(subtitles_, watch_.OptionSet()))
+        observer_.LeftBehind(lost);
     Verdict verdict;
     verdict.failure = FindFailure({request_, files_, brokenOff_, movie_.ReadError(), WhyItEndedEarly(),
                                    userStopped_, outcome_, request_.begin + Position()});

@@ -4,6 +4,7 @@
 #define MOVIECONV_HOST_CONVERT_COURSE_H
 
 #include "host/convert/Bell.h"
+#include "host/convert/CarryOver.h"
 #include "host/convert/ClipCutter.h"
 #include "host/convert/Engine.h"
 #include "host/convert/FileLedger.h"
@@ -19,6 +20,7 @@
 #include <atomic>
 #include <optional>
 #include <string>
+#include <vector>
 
 namespace movieconv {
 
@@ -84,6 +86,7 @@ private:
     WriterWatch watch_;
     FileLedger files_;
     Engine engine_;
+    std::vector<Carried::Subtitles> subtitles_; // that are in the output
 
     // The engine's worker sets these.
     std::atomic<double> position_{0}; // in the clip, in seconds

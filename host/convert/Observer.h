@@ -79,10 +79,10 @@ struct Warning {
 
 /// Something of the source that its output does not hold, although the conversion goes well.
 struct NotCarried {
-    /// "pictures", "sound", "subtitles", "chapters", "cover", "attachment", "data", "tags" or, of a track
-    /// that is carried, "label".
+    /// "pictures", "sound", "subtitles", "chapters", "cover", "attachment", "timecode", "data", "tags" or,
+    /// of a track that is carried, "label".
     std::string kind;
-    std::optional<int> number; ///< Of the stream in the source; nothing for chapters and tags.
+    std::optional<int> number; ///< Of the stream in the source; nothing for chapters, tags and timecode.
     std::string codec;         ///< Of an attached file of no codec its name. Empty when it is not known.
     std::string language;      ///< Empty when it is not known.
     std::string reason;        ///< A clause.

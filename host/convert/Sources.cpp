@@ -20,8 +20,7 @@ SourceChoice ChoiceOf(const Request& request) {
             .deinterlace = request.deinterlace,
             .stampsOnly = request.piece && !request.piece->pictures,
             .fromStart = request.piece && request.piece->fromStart,
-            .playlists = request.playlists,
-            .untilNow = request.piece.has_value()};
+            .playlists = request.playlists};
 }
 
 /// ChoiceOf with what is to be cropped. Throws SourceError.

@@ -44,25 +44,22 @@ Request RequestOf(const PieceOrder& order, const Plan& plan, int number, const s
     return request;
 }
 
-/// Throws Failure when a file is something else, which must not be lost.
-void RequirePlan(const std::string& path) {
-    try {
-        ReadPlan(path);
-    } catch (const Failure& failure) {
-        throw Failure(Category::kOutput, "the plan would replace another file: " + failure.Text(),
-                      Reason::kExists);
-    }
-}
-
 /// One piece being made, from its conversion to its name.
 class PieceErrand final : public Errand {
 public:
     /// `length`: seconds of pictures that the piece brings.
-    PieceErrand(const Plan& plan, const std::string& planPath, int number, std::string file, double length)
-        : plan_(plan), planPath_(planPath), number_(number), file_(std::move(file)), length_(length) {}
+    PieceErrand(Outlet& news, const Plan& plan, const std::string& planPath, int number, std::string file,
+                double length)
+        : news_(news),
+          plan_(plan),
+          planPath_(planPath),
+          number_(number),
+          file_(std::move(file)),
+          length_(length) {}
 
     double Share(const Progress& latest) const override { return std::min(latest.position, length_); }
     void Closed(const ClosedFile& news) override { pictures_ = news.pictures; }
+    void LeftBehind(const NotCarried& news) override { news_.LeftBehind(news); }
     void Conclude(Verdict& verdict) override {
         if (verdict.outcome != Outcome::kDone) {
             unlink(file_.c_str()); // whatever was made is not the piece
@@ -92,6 +89,7 @@ private:
                                   number_, pictures_, planned, plan_.source.path));
     }
 
+    Outlet& news_;
     const Plan& plan_;
     const std::string& planPath_;
     const int number_;
@@ -140,10 +138,11 @@ std::optional<Plan> Foreman::Prepare() {
         return plan;
     }
     CheckOutput(*order_.request);
-    Plan begun = BeginPlan(*order_.request, order_.division);
-    if (std::optional<Plan> before = Leftover(begun))
+    if (std::optional<Plan> before = Leftover(BeginPlan(*order_.request, order_.division)))
         return before;
-    std::optional<Plan> plan = MakePlan(std::move(begun), [this] { return Stopped(); });
+    std::optional<Plan> plan = MakePlan(
+        *order_.request, order_.division, [](void* self) { return static_cast<Foreman*>(self)->Stopped(); },
+        this);
     if (plan)
         WritePlan(order_.planPath, *plan);
     return plan;
@@ -161,8 +160,6 @@ std::optional<Plan> Foreman::Leftover(const Plan& now) {
                           Reason::kCannotResume);
         return before;
     }
-    if (planned && !order_.replace)
-        RequirePlan(order_.planPath);
     if (!order_.resume && (planned || pieces > 0)) {
         News().Warned({Warning::Kind::kLeftover,
                        fmt::format("\"{}\" with {} pieces is left of an earlier run; it is made anew",
@@ -242,7 +239,7 @@ std::optional<Crew::Assignment> Foreman::Next() {
         length = LengthOf(plan_.pictures[static_cast<std::size_t>(number)]);
     const std::string file = NameInTheMaking(PiecePath(order_.planPath, number));
     return Assignment{RequestOf(order_, plan_, number, file),
-                      std::make_unique<PieceErrand>(plan_, order_.planPath, number, file, length)};
+                      std::make_unique<PieceErrand>(News(), plan_, order_.planPath, number, file, length)};
 }
 
 /// The first failure stays.
@@ -276,8 +273,7 @@ void Foreman::ReportFinishing(double share) {
 }
 
 void Foreman::JoinAll() {
-    CheckAgainst(plan_); // pieces of what was changed meanwhile do not belong together
-    if (order_.resume)   // what a killed joining left
+    if (order_.resume) // what a killed joining left
         unlink((plan_.output + text::PartialSuffix(1)).c_str());
     ReportFinishing(0);
     double told = 0;

@@ -9,6 +9,7 @@
 #include "host/convert/FileLedger.h"
 #include "host/convert/OutputCheck.h"
 #include "host/convert/Sources.h"
+#include "host/convert/Timecode.h"
 #include "host/convert/WriterWatch.h"
 #include "host/pieces/PieceFile.h"
 #include "host/source/MediaTime.h"
@@ -62,8 +63,10 @@ Verdict JoinPieces(const Plan& plan, const std::string& planPath, bool replace, 
     FileLedger files(observer);
     const Engine engine =
         MakeEngine(request, movie.Info(), movie.Pictures(), movie.Sound(), watch.OptionSet());
-    for (const NotCarried& left : CarryOver(movie, request, ChooseFormat(request), watch.OptionSet()))
+    const Carried carried = CarryOver(movie, request, ChooseFormat(request), watch.OptionSet());
+    for (const NotCarried& left : carried.left)
         observer.LeftBehind(left);
+    CarryTimecode(movie.Info(), request, ChooseFormat(request), watch.OptionSet(), request.begin);
 
     EncodeParam param{};
     MCGetEncodeParam(engine.get(), &param);

@@ -29,7 +29,7 @@ void Add(CueList& list, av::Packet packet, int64_t begin, int64_t duration) {
 
 void ReadStream(CueList& list, const Source& source, const BurnWish& wish, bool playlists) {
     const int stream = WantedTracks(source.Info().streams, StreamKind::kSubtitles, {{wish.what}}).front();
-    MovieReader reader(source.Info().path, playlists, Growth::kRead, std::make_shared<Interruption>());
+    MovieReader reader(source.Info().path, playlists, source.Reader().Interruptible());
     if (!reader.IsSeekable())
         throw TrackError("the subtitles of a pipe cannot be drawn into its pictures");
     AVFormatContext* context = reader.Context();
@@ -54,6 +54,8 @@ void ReadStream(CueList& list, const Source& source, const BurnWish& wish, bool 
             return;
         if (packet->stream_index != stream || stamp == AV_NOPTS_VALUE)
             continue;
+        if (IsPlainText(found.codecpar->codec_id))
+            MakeUtf8(*packet);
         const int64_t begin = reader.MediaTime(stamp, found.time_base);
         if (begin >= wish.end)
             return;

@@ -37,7 +37,7 @@ constexpr Language kLanguages[] = {
 };
 // clang-format on
 
-// Where QuickTime's name, as FFmpeg has it, is neither of these.
+// Where the name that FFmpeg has for QuickTime's number is neither of these.
 constexpr std::pair<std::string_view, std::string_view> kQuickTimeNames[] = {
     {"fao", "fo "}, {"gle", "iri"}, {"hrv", "hr "}, {"nno", "nor"},
     {"nob", "nor"}, {"pan", "pa "}, {"srp", "sr "}, {"swe", "sve"},
@@ -93,9 +93,6 @@ std::vector<std::string> CodesFor(std::string_view code) {
     add(three);
     if (const Language* found = Find(three))
         add(found->other);
-    for (const auto& [own, name] : kQuickTimeNames)
-        if (three == own)
-            add(name);
     return codes;
 }
 

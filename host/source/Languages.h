@@ -16,7 +16,7 @@ std::string ThreeLetters(std::string_view code);
 std::string LanguageName(std::string_view code);
 
 /// The codes under which containers may know the language, the nearest to `code` first: itself where it is
-/// one of three letters, those of ISO 639-2, QuickTime's own.
+/// one of three letters, then those of ISO 639-2.
 std::vector<std::string> CodesFor(std::string_view code);
 
 } // namespace movieconv

@@ -60,14 +60,25 @@ BesideSound& Movie::ReadSoundBeside(int stream) {
 }
 
 BesidePackets& Movie::ReadPacketsBeside(int stream) {
+    const bool isPlain = IsPlainText(StreamOf(stream).codecpar->codec_id);
     auto track = std::make_unique<BesidePackets>(
-        [this, stream](int64_t until, bool wait) { return demuxer_.TakeBeside(stream, until, wait); },
+        [this, stream, isPlain](int64_t until, bool wait) {
+            Demuxer::Beside taken = demuxer_.TakeBeside(stream, until, wait);
+            if (taken.packet && isPlain && MakeUtf8(*taken.packet))
+                ++cuesInOtherCharset_;
+            return taken;
+        },
         [this](int64_t stamp, AVRational timeBase) { return source_.Reader().MediaTime(stamp, timeBase); },
         StreamOf(stream).time_base, bounds_, failures_);
     BesidePackets& made = *track;
     AddBeside(stream, std::move(track));
-    if (bounds_.begin > 0)
-        made.Precede(std::move(EarlierCues()[stream]));
+    if (bounds_.begin > 0) {
+        std::vector<av::Packet>& earlier = EarlierCues()[stream];
+        for (const av::Packet& packet : earlier)
+            if (isPlain && MakeUtf8(*packet))
+                ++cuesInOtherCharset_;
+        made.Precede(std::move(earlier));
+    }
     return made;
 }
 
@@ -110,7 +121,7 @@ std::map<int, std::vector<av::Packet>>& Movie::EarlierCues() {
         if (stream.kind == StreamKind::kSubtitles)
             subtitles.push_back(stream.index);
     const int main = Info().pictures ? Info().pictures->index : Info().sound->index;
-    MovieReader again(Info().path, choice_.playlists, Growth::kRead, std::make_shared<Interruption>());
+    MovieReader again(Info().path, choice_.playlists, source_.Reader().Interruptible());
     earlierCues_ = ReadEarlierCues(again, main, std::move(subtitles), bounds_.begin);
     return earlierCues_;
 }
@@ -141,14 +152,15 @@ std::optional<Shortfall> Movie::Missing() const {
 
 std::vector<std::string> Movie::Complaints() const {
     std::vector<std::string> texts;
+    if (const int64_t cues = cuesInOtherCharset_; cues > 0)
+        texts.push_back(fmt::format("{} of its subtitles {} not in UTF-8 and taken for Windows-1252", cues,
+                                    cues == 1 ? "was" : "were"));
     if (pictures_ && pictures_->Deinterlaced())
         texts.emplace_back("interlaced pictures were made progressive");
     if (pictures_ && IsHdr(*Info().pictures) && !choice_.keepHdr)
         texts.emplace_back("its HDR pictures were brought to the light and colours of BT.709");
     else if (pictures_ && Info().pictures->depth > 8 && !choice_.deep)
         texts.push_back(fmt::format("its pictures of {} bits got 8", Info().pictures->depth));
-    if (pictures_ && Info().pictures->transparent)
-        texts.emplace_back("the transparency of its pictures was left out");
     if (const int jumps = demuxer_.ClockJumps(); jumps > 0) {
         texts.push_back(fmt::format("the source's clock jumped {}; the parts were joined",
                                     jumps == 1 ? "once" : fmt::format("{} times", jumps)));

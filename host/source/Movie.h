@@ -13,6 +13,7 @@
 #include "host/source/SubtitleBurner.h"
 #include "host/source/SubtitleFile.h"
 
+#include <atomic>
 #include <map>
 #include <memory>
 #include <optional>
@@ -116,6 +117,7 @@ private:
     double begin_ = 0;                                   // seconds
     std::map<int, std::vector<av::Packet>> earlierCues_; // by stream, from before the begin
     bool earlierCuesRead_ = false;
+    std::atomic<int64_t> cuesInOtherCharset_{0};
     std::vector<int> besideStreams_;
     std::vector<std::unique_ptr<SubtitleFile>> subtitleFiles_;
     std::vector<std::unique_ptr<BesideTrack>> beside_;

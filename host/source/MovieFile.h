@@ -6,10 +6,12 @@
 #include "host/source/CompanionFiles.h"
 #include "host/source/Completeness.h"
 #include "host/source/InputFile.h"
+#include "host/source/LanguageTags.h"
 
 #include <cstdint>
 #include <memory>
 #include <string>
+#include <vector>
 
 namespace movieconv {
 
@@ -20,7 +22,7 @@ public:
     /// file: what names other files is opened only if `playlists`, and then may name only movies in its own
     /// folder and below. `interruption` ends this, too. Throws SourceError, PlaylistError for a playlist
     /// that was not allowed.
-    MovieFile(const std::string& path, bool playlists, Growth growth,
+    MovieFile(const std::string& path, bool playlists,
               const std::shared_ptr<const Interruption>& interruption);
     MovieFile(const MovieFile&) = delete;
     MovieFile& operator=(const MovieFile&) = delete;
@@ -35,6 +37,9 @@ public:
 
     /// Whether the file promises more than it holds.
     bool IsCutOff() const { return movieconv::IsCutOff(bytes_, *input_); }
+
+    /// As ReadLanguageTags.
+    std::vector<std::string> LanguageTags() const { return ReadLanguageTags(bytes_, *input_); }
 
     /// Why a file that the source names was not read; empty when all were.
     const std::string& Refusal() const { return companions_.Refusal(); }

@@ -1,5 +1,6 @@
 #include "host/source/Source.h"
 
+#include "host/source/Languages.h"
 #include "host/source/Probe.h"
 #include "host/source/StreamChoice.h"
 #include "host/source/StreamDescription.h"
@@ -19,18 +20,30 @@ std::string NothingToConvert(const std::string& path, const SourceChoice& choice
                                                        : "sound");
 }
 
+/// Where the container tells more than FFmpeg reads.
+void SetLanguages(const std::vector<std::string>& tags, std::vector<StreamInfo>& streams) {
+    for (std::size_t i = 0; i < streams.size(); ++i) {
+        const std::string& tag = tags[i];
+        const std::string language = ThreeLetters(tag.substr(0, tag.find('-')));
+        if (language.size() == 3 && language != ThreeLetters(streams[i].language))
+            streams[i].language = language;
+        if (tag.find('-') != std::string::npos)
+            streams[i].languageTag = tag;
+    }
+}
+
 } // namespace
 
 Source::Source(const std::string& path, const SourceChoice& choice,
                std::shared_ptr<Interruption> interruption)
-    : reader_(path, choice.playlists, choice.untilNow ? Growth::kLeftOut : Growth::kRead,
-              std::move(interruption)) {
+    : reader_(path, choice.playlists, std::move(interruption)) {
     AVFormatContext& context = *reader_.Context();
     info_.path = path;
     info_.bytes = reader_.File().Bytes();
     info_.container =
         context.iformat->long_name != nullptr ? context.iformat->long_name : context.iformat->name;
     info_.streams = DescribeStreams(context, reader_.Start());
+    SetLanguages(reader_.File().LanguageTags(), info_.streams);
     info_.chapters = DescribeChapters(context, reader_.Start());
     info_.tags = DescribeTags(context.metadata);
     const ChosenStreams chosen = ChooseStreams(info_.streams, choice);
@@ -46,6 +59,8 @@ Source::Source(const std::string& path, const SourceChoice& choice,
     }
     if (selected.empty())
         throw SourceError(NothingToConvert(path, choice));
+    for (Tag& tag : DescribeService(context, selected.front()))
+        info_.tags.push_back(std::move(tag));
     reader_.Select(std::move(selected));
     Probe();
     if (info_.pictures)

@@ -7,9 +7,7 @@
 #include "host/source/Crop.h"
 #include "host/source/Deinterlace.h"
 #include "host/source/TrackWishes.h"
-#include "media/Limits.h"
 
-#include <algorithm>
 #include <cstdint>
 #include <optional>
 #include <string>
@@ -46,12 +44,11 @@ struct LightLevel {
 };
 
 struct PictureStreamInfo {
-    int index = -1;           ///< Stream number in the container.
-    std::string codec;        ///< Codec name, "h264".
-    std::string pixelFormat;  ///< FFmpeg's name, "yuv420p".
-    int depth = 8;            ///< Bits of a component.
-    bool transparent = false; ///< Has a plane of opacity, which no conversion carries.
-    int width = 0;            ///< As shown, after rotation and cropping.
+    int index = -1;          ///< Stream number in the container.
+    std::string codec;       ///< Codec name, "h264".
+    std::string pixelFormat; ///< FFmpeg's name, "yuv420p".
+    int depth = 8;           ///< Bits of a component.
+    int width = 0;           ///< As shown, after rotation and cropping.
     int height = 0;
     int quarterTurns = 0;  ///< Clockwise turns by 90 degrees that bring the stored picture upright.
     bool mirrored = false; ///< The stored picture is mirrored left to right before it is turned.
@@ -81,12 +78,6 @@ inline bool IsHdr(const PictureStreamInfo& pictures) {
     return pictures.colorTransfer == kPerceptualQuantizer || pictures.colorTransfer == kHybridLogGamma;
 }
 
-/// Pictures per second as the engine is told. It takes a higher rate for a mistake, and would have 30 made;
-/// told this one, every picture is kept with its own time.
-inline double CredibleRate(const PictureStreamInfo& pictures) {
-    return std::min(pictures.frameRate, kHighestFrameRate);
-}
-
 struct SoundStreamInfo {
     int index = -1;
     std::string codec;
@@ -112,8 +103,9 @@ struct StreamInfo {
     int index = -1; ///< Number in the container.
     StreamKind kind = StreamKind::kData;
     std::string codec;
-    std::string profile;  ///< Of the codec, "High"; empty when it is not known.
-    std::string language; ///< As the container has it, mostly ISO 639-2; empty when it is undetermined.
+    std::string profile;     ///< Of the codec, "High"; empty when it is not known.
+    std::string language;    ///< As the container has it, mostly ISO 639-2; empty when it is undetermined.
+    std::string languageTag; ///< BCP 47, "pt-BR", where the container tells more than the language.
     std::string title;
     StreamFlags flags;
     bool decodable = false;
@@ -166,7 +158,6 @@ struct SourceChoice {
     bool stampsOnly = false; ///< Do not decode the pictures.
     bool fromStart = false;  ///< Read from the start of the source, whatever the begin.
     bool playlists = false;  ///< Also open what names other movies, in its own folder and below.
-    bool untilNow = false;   ///< Leave out what is written to the file after it was opened.
 };
 
 } // namespace movieconv

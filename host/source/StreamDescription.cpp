@@ -6,8 +6,8 @@
 #include <algorithm>
 #include <array>
 #include <cmath>
-#include <cstring>
 #include <string_view>
+#include <utility>
 
 extern "C" {
 #include <libavutil/avstring.h>
@@ -100,17 +100,6 @@ void ReadLight(const AVStream* stream, PictureStreamInfo& info) {
     info.dolbyVision = sideData(AV_PKT_DATA_DOVI_CONF) != nullptr;
 }
 
-/// Opacity beside VP9's pictures is told by a tag only. A GIF's pixels always have room for it, and hardly
-/// ever use it.
-bool HasOpacity(const AVStream* stream, const AVPixFmtDescriptor& format) {
-    const AVDictionaryEntry* tag = av_dict_get(stream->metadata, "alpha_mode", nullptr, 0);
-    const bool isTagged = tag != nullptr && std::strcmp(tag->value, "1") == 0;
-    const bool isInPixels = (format.flags & AV_PIX_FMT_FLAG_ALPHA) != 0 &&
-                            (format.flags & AV_PIX_FMT_FLAG_PAL) == 0 &&
-                            stream->codecpar->codec_id != AV_CODEC_ID_GIF;
-    return isTagged || isInPixels;
-}
-
 PictureStreamInfo DescribePictures(AVFormatContext& context, AVStream* stream) {
     const AVCodecParameters& parameters = *stream->codecpar;
     PictureStreamInfo info;
@@ -120,7 +109,6 @@ PictureStreamInfo DescribePictures(AVFormatContext& context, AVStream* stream) {
             av_pix_fmt_desc_get(static_cast<AVPixelFormat>(parameters.format))) {
         info.pixelFormat = format->name;
         info.depth = format->comp[0].depth;
-        info.transparent = HasOpacity(stream, *format);
     } else {
         info.pixelFormat = "unknown";
     }
@@ -291,6 +279,22 @@ std::vector<Tag> DescribeTags(const AVDictionary* metadata) {
     while ((entry = av_dict_get(metadata, "", entry, AV_DICT_IGNORE_SUFFIX)) != nullptr)
         if (!IsNote(entry->key))
             tags.push_back({ToUtf8(entry->key, ""), ToUtf8(entry->value, "")});
+    return tags;
+}
+
+std::vector<Tag> DescribeService(AVFormatContext& context, int stream) {
+    // What FFmpeg's multiplexer writes of services that have no name.
+    constexpr std::string_view kNoName = "Service01";
+    constexpr std::string_view kNoProvider = "FFmpeg";
+    std::vector<Tag> tags;
+    const AVProgram* program = av_find_program_from_stream(&context, nullptr, stream);
+    if (program == nullptr)
+        return tags;
+    if (std::string name = TagOf(program->metadata, "service_name"); !name.empty() && name != kNoName)
+        tags.push_back({"title", std::move(name)});
+    if (std::string provider = TagOf(program->metadata, "service_provider");
+        !provider.empty() && provider != kNoProvider)
+        tags.push_back({"service_provider", std::move(provider)});
     return tags;
 }
 

@@ -20,6 +20,9 @@ std::vector<Chapter> DescribeChapters(const AVFormatContext& context, int64_t st
 /// What people wrote: nothing that a multiplexer notes about its own file.
 std::vector<Tag> DescribeTags(const AVDictionary* metadata);
 
+/// What the broadcast service is called to which a stream belongs, as "title", and whose it is.
+std::vector<Tag> DescribeService(AVFormatContext& context, int stream);
+
 /// Takes down what a stream or a frame tells of the light that its pictures were made for; null where it does
 /// not.
 void TakeLight(const AVMasteringDisplayMetadata* display, const AVContentLightMetadata* light,

@@ -75,6 +75,25 @@ std::string ToUtf8(std::string text, const std::string& charset) {
     return std::move(*Convert(text, "ISO-8859-1")); // which has a letter for every byte
 }
 
+bool IsPlainText(AVCodecID codec) {
+    return codec == AV_CODEC_ID_SUBRIP || codec == AV_CODEC_ID_TEXT || codec == AV_CODEC_ID_ASS ||
+           codec == AV_CODEC_ID_SSA || codec == AV_CODEC_ID_WEBVTT;
+}
+
+bool MakeUtf8(AVPacket& packet) {
+    const std::string text(reinterpret_cast<const char*>(packet.data), static_cast<std::size_t>(packet.size));
+    const std::string converted = ToUtf8(text, "");
+    if (converted == text)
+        return false;
+    const av::Packet made = av::NewPacket();
+    av::CheckMemory(av_new_packet(made.get(), static_cast<int>(converted.size())));
+    std::copy(converted.begin(), converted.end(), made->data);
+    av::CheckMemory(av_packet_copy_props(made.get(), &packet));
+    av_packet_unref(&packet);
+    av_packet_move_ref(&packet, made.get());
+    return true;
+}
+
 SubtitleFile::SubtitleFile(const std::string& path, const std::string& charset) {
     const auto refuse = [&](const std::string& reason) {
         throw SourceError(fmt::format("cannot read subtitles from \"{}\": {}", path, reason));

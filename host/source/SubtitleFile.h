@@ -16,6 +16,12 @@ namespace movieconv {
 /// set, or the text is none in it.
 std::string ToUtf8(std::string text, const std::string& charset);
 
+/// Whether packets of the codec are nothing but text.
+bool IsPlainText(AVCodecID codec);
+
+/// A packet of subtitles made of plain text, in UTF-8 whatever it is in. Whether it had to be changed.
+bool MakeUtf8(AVPacket& packet);
+
 /// For one thread.
 class SubtitleFile {
 public:

@@ -90,7 +90,7 @@ std::string DescribeStream(const StreamInfo& stream, Certainty certainty) {
     if (stream.kind == StreamKind::kSubtitles)
         text += stream.textual ? ", text" : ", bitmaps";
     if (!stream.language.empty())
-        text += fmt::format(", {}", stream.language);
+        text += fmt::format(", {}", stream.languageTag.empty() ? stream.language : stream.languageTag);
     if (!stream.title.empty())
         text += fmt::format(", \"{}\"", stream.title);
     text += DescribeFlags(stream.flags);

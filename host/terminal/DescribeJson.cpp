@@ -79,6 +79,7 @@ Json Object(const StreamInfo& stream) {
     Json object{{"index", stream.index},          {"kind", KindName(stream.kind)}, {"codec", stream.codec},
                 {"profile", stream.profile},      {"language", stream.language},   {"title", stream.title},
                 {"flags", FlagsOf(stream.flags)}, {"decodable", stream.decodable}};
+    object["language_tag"] = stream.languageTag;
     object["begin_s"] = stream.begin ? Json(*stream.begin) : Json(nullptr);
     object["end_s"] = Told(stream.pictures ? stream.pictures->duration
                            : stream.sound  ? stream.sound->duration

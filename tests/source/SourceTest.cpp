@@ -1,5 +1,6 @@
 // How a movie is described, which of its streams are chosen, and how far it is read ahead.
 #include "host/source/Source.h"
+#include "host/source/CueList.h"
 #include "host/source/Demuxer.h"
 #include "host/source/Failures.h"
 #include "host/source/StreamChoice.h"
@@ -227,6 +228,21 @@ TEST(Failures, KeepTheFirstReasonAndStopTheOthers) {
     failures.Note("third");
     EXPECT_EQ(failures.First(), "first");
     EXPECT_EQ(stops, 2);
+}
+
+TEST(Source, ReadingAheadIsInterruptedWithIt) {
+    const Folder folder;
+    WriteFile(folder / "a.srt", "1\n00:00:00,200 --> 00:00:00,600\nA\n");
+    const std::string path =
+        Make("with_cue.mkv",
+             Join(CountedPictures(1), Args{"-i", folder / "a.srt", "-c:v", "mpeg4", "-c:s", "srt"}));
+    const auto interruption = std::make_shared<Interruption>();
+    const Source source(path, {}, interruption);
+    BurnWish wish;
+    wish.what = "1";
+    EXPECT_EQ(ReadCues(source, wish, false).cues.size(), 1);
+    interruption->Interrupt();
+    EXPECT_THROW(ReadCues(source, wish, false), SourceError);
 }
 
 } // namespace

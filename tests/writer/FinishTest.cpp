@@ -131,6 +131,7 @@ struct Layout {
     uint32_t format, sound;
     double length; ///< Of the source, as the writer is told, in seconds; it lasts 12.
     const char* boxes;
+    const char* timecode = "";
 };
 
 class Finish : public testing::TestWithParam<Layout> {
@@ -148,6 +149,9 @@ protected:
     void Write() {
         RecordedFiles files(close_);
         writer::OptionSet set(kWriterDefaultSet, WriterOptions{});
+        set.ChangeExtras([](writer::Extras& extras) {
+            return writer::SetTag(extras.pictures.tags, "timecode", GetParam().timecode);
+        });
         VideoFormat video = movie_.Video();
         AudioFormat audio = movie_.Audio();
         video.dDuration = audio.dDuration = GetParam().length;
@@ -169,6 +173,12 @@ TEST_P(Finish, WhateverHasReachedTheDiskIsAWholeMovie) {
     const ReadMovie whole = ReadMovieFile(path_);
     ASSERT_TRUE(whole.readable);
     ASSERT_EQ(whole.pictures.size(), 300U);
+    std::string timecode;
+    WithStreams(path_, [&](const AVStream& stream) {
+        const AVDictionaryEntry* entry = av_dict_get(stream.metadata, "timecode", nullptr, 0);
+        timecode = entry != nullptr ? entry->value : timecode;
+    });
+    EXPECT_EQ(timecode, GetParam().timecode);
     const std::string torn = folder_ / "torn";
     std::string before = close_.before;
     for (const std::vector<Piece>& pieces : close_.written) {
@@ -294,8 +304,11 @@ TEST_P(Finish, ReachesBeyondFourGigabytes) {
     const writer::Extras extras;
     const writer::TrackLabel label;
     const auto makeIndex = [&](int64_t place) {
-        writer::Mp4Index index(container, true, extras);
+        writer::Mp4Index index(container, true, extras, place);
         WithStreams(path_, [&](const AVStream& stream) {
+            if (stream.codecpar->codec_type ==
+                AVMEDIA_TYPE_DATA) // the timecode, which is made with the index
+                return;
             index.AddStream(
                 {stream.codecpar,
                  stream.time_base,
@@ -315,7 +328,7 @@ TEST_P(Finish, ReachesBeyondFourGigabytes) {
             }
             index.Add(packet, content);
         });
-        return index.Finish(place);
+        return index.Finish();
     };
     room.Finish(*file, makeIndex, 0, [](writer::ByteFile&) {});
     const ReadMovie movie = ReadMovieFile(path);
@@ -330,7 +343,9 @@ INSTANTIATE_TEST_SUITE_P(
         Layout{"InFront", FourCC("MP4 "), FourCC("AAC "), 12, "ftyp free moov free mdat "},
         Layout{"InFrontOfQuickTime", FourCC("MOV "), FourCC("AAC "), 12, "ftyp free moov free mdat "},
         Layout{"DescribedByItsPackets", FourCC("MP4 "), FourCC("AC3 "), 12, "ftyp free moov free mdat "},
-        Layout{"Behind", FourCC("MP4 "), FourCC("AAC "), 0.1, "ftyp free mdat moov "}),
+        Layout{"Behind", FourCC("MP4 "), FourCC("AAC "), 0.1, "ftyp free mdat moov "},
+        Layout{"WithTimecode", FourCC("MOV "), FourCC("AAC "), 12, "ftyp free moov free mdat ",
+               "10:00:00:00"}),
     [](const auto& info) { return info.param.name; });
 
 } // namespace

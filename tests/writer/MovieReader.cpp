@@ -88,8 +88,11 @@ ReadMovie ReadMovieFile(const std::string& path) {
     movie.duration = static_cast<double>(context->duration) / AV_TIME_BASE;
     std::map<int, av::CodecContext> decoders;
     for (unsigned i = 0; i < context->nb_streams; ++i) {
-        Describe(*context, *context->streams[i], movie);
-        decoders[static_cast<int>(i)] = OpenDecoder(*context->streams[i]);
+        AVStream& stream = *context->streams[i];
+        if (stream.codecpar->codec_type == AVMEDIA_TYPE_DATA) // a timecode
+            continue;
+        Describe(*context, stream, movie);
+        decoders[static_cast<int>(i)] = OpenDecoder(stream);
     }
     movie.readable = true;
     const auto decode = [&](int index, AVPacket* packet) {
@@ -102,7 +105,8 @@ ReadMovie ReadMovieFile(const std::string& path) {
     };
     const av::Packet packet(av_packet_alloc());
     while (av_read_frame(context, packet.get()) >= 0) {
-        decode(packet->stream_index, packet.get());
+        if (decoders.count(packet->stream_index) != 0)
+            decode(packet->stream_index, packet.get());
         av_packet_unref(packet.get());
     }
     for (const auto& entry : decoders)

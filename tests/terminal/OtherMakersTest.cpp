@@ -1,0 +1,137 @@
+// Movies as other programs make them: what they hold in ways of their own is carried over, or told.
+#include "tests/support/Folder.h"
+#include "tests/support/Program.h"
+#include "tests/support/TestMovies.h"
+#include "tests/terminal/WholeMovie.h"
+
+#include <gtest/gtest.h>
+
+#include <string>
+
+namespace {
+
+using program::Call;
+using program::Result;
+using test_movies::Args;
+using test_movies::CountedPictures;
+using test_movies::Join;
+using whole_movie::Json;
+
+/// One second with subtitles in Latin letters of one byte each.
+void MakeLatin(const std::string& path, const Folder& folder) {
+    WriteFile(folder / "latin.srt", "1\n00:00:00,200 --> 00:00:00,600\nGr\xFC\xDF"
+                                    "e\n\n2\n00:00:00,700 --> 00:00:00,900\nplain\n");
+    EXPECT_EQ(program::Run(Join(Args{"ffmpeg", "-v", "error"}, CountedPictures(1),
+                                Args{"-i", folder / "latin.srt", "-c:v", "mpeg4", "-c:s", "copy", path}))
+                  .code,
+              0);
+}
+
+TEST(OtherMakers, SubtitlesInOtherCharacterSetsComeInUtf8) {
+    const Folder folder;
+    MakeLatin(folder / "latin.mkv", folder);
+    for (const char* name : {"out.mp4", "out.mkv"}) {
+        SCOPED_TRACE(name);
+        const Result made = Call({folder / "latin.mkv", folder / name, "--progress", "none"});
+        EXPECT_EQ(made.code, 0);
+        EXPECT_TRUE(Has(made.err, "1 of its subtitles was not in UTF-8 and taken for Windows-1252"))
+            << made.err;
+        const std::vector<whole_movie::Cue> cues = whole_movie::CuesOf(folder / name, 0);
+        ASSERT_EQ(cues.size(), 2);
+        EXPECT_EQ(cues[0].text, "Gr\xC3\xBC\xC3\x9F"
+                                "e");
+    }
+}
+
+TEST(OtherMakers, CuesThatCannotBeConvertedAreCounted) {
+    const Folder folder;
+    WriteFile(folder / "a.srt",
+              "1\n00:00:00,200 --> 00:00:00,600\nGrxxe\n\n2\n00:00:00,700 --> 00:00:00,900\nplain\n");
+    ASSERT_EQ(program::Run(Join(Args{"ffmpeg", "-v", "error"}, CountedPictures(1),
+                                Args{"-i", folder / "a.srt", "-c:v", "mpeg4", "-c:s", "mov_text",
+                                     "-metadata:s:s", "language=ger", folder / "a.mp4"}))
+                  .code,
+              0);
+    std::string movie = ReadFile(folder / "a.mp4");
+    const size_t word = movie.find("Grxxe");
+    ASSERT_NE(word, std::string::npos);
+    WriteFile(folder / "a.mp4", movie.replace(word, 5,
+                                              "Gr\xFC\xDF"
+                                              "e"));
+    for (const Args& options : {Args{}, Args{"--split", "0.5"}, Args{"--jobs", "2", "--pieces", "2"}}) {
+        const Result made =
+            Call(Join(Args{folder / "a.mp4", folder / "out.mkv", "-y", "--progress", "none"}, options));
+        EXPECT_EQ(made.code, 0);
+        EXPECT_TRUE(Has(made.err, "not carried: subtitles 1 (mov_text, German): ")) << made.err;
+        EXPECT_TRUE(Has(made.err, "of their texts could not be converted")) << made.err;
+    }
+}
+
+/// Regions and scripts of languages, as an independent program writes and reads them.
+TEST(OtherMakers, LanguagesKeepTheirRegions) {
+    if (program::Run({"sh", "-c", "command -v mkvmerge"}).code != 0)
+        GTEST_SKIP() << "without mkvmerge";
+    const Folder folder;
+    Args inputs = CountedPictures(1);
+    for (int i = 0; i < 3; ++i)
+        inputs = Join(inputs, Args{"-f", "lavfi", "-i", "sine=d=1"});
+    ASSERT_EQ(program::Run(Join(Args{"ffmpeg", "-v", "error"}, inputs,
+                                Args{"-map", "0", "-map", "1", "-map", "2", "-map", "3", "-c:v", "mpeg4",
+                                     "-c:a", "flac", folder / "plain.mkv"}))
+                  .code,
+              0);
+    ASSERT_EQ(program::Run({"mkvmerge", "-q", "-o", folder / "in.mkv", "--language", "0:und", "--language",
+                            "1:pt-BR", "--language", "2:zh-Hans", "--language", "3:de", folder / "plain.mkv"})
+                  .code,
+              0);
+    const struct {
+        const char* track;
+        const char* language;
+        const char* tag;
+    } expected[] = {{"1", "por", "pt-BR"}, {"2", "chi", "zh-Hans"}, {"3", "ger", "de"}};
+    std::string from = "in.mkv";
+    for (const std::string name : {"a.mkv", "b.mp4", "c.mov", "d.mkv"}) { // each of the one before
+        SCOPED_TRACE(name);
+        const Result made = Call({folder / from, folder / name, "--progress", "none"});
+        EXPECT_EQ(made.code, 0);
+        EXPECT_EQ(made.err, "");
+        const Json info = Json::parse(Call({"--info", folder / name, "--progress", "json"}).out);
+        const Json probe = whole_movie::Probe(folder / name);
+        for (size_t i = 1; i < 4; ++i) {
+            EXPECT_EQ(probe["streams"][i]["tags"]["language"], expected[i - 1].language);
+            const std::string tag = expected[i - 1].tag;
+            EXPECT_EQ(info["streams"][i]["language_tag"], tag == "de" ? "" : tag);
+            EXPECT_EQ(program::Run({"ffmpeg", "-v", "error", "-i", folder / name, "-f", "null", "-"}).err,
+                      "");
+        }
+        from = name;
+    }
+    for (const char* name : {"a.mkv", "d.mkv"}) {
+        const Json read = whole_movie::Identify(folder / name);
+        EXPECT_TRUE(read["warnings"].empty() && read["errors"].empty()) << read;
+        for (size_t i = 1; i < 3; ++i)
+            EXPECT_EQ(read["tracks"][i]["properties"]["language_ietf"], expected[i - 1].tag);
+    }
+    EXPECT_TRUE(Has(
+        Call({folder / "in.mkv", folder / "out.ts", "--progress", "none"}).err,
+        "not carried: label 1 (flac, Portuguese): MPEG transport stream cannot hold its language as pt-BR"));
+}
+
+TEST(OtherMakers, ABroadcastServiceIsATitle) {
+    const Folder folder;
+    ASSERT_EQ(program::Run(Join(Args{"ffmpeg", "-v", "error"}, CountedPictures(1),
+                                Args{"-c:v", "mpeg2video", "-metadata", "service_name=Das Programm",
+                                     folder / "in.ts"}))
+                  .code,
+              0);
+    ASSERT_EQ(Call({folder / "in.ts", folder / "a.mkv", "-q"}).code, 0);
+    EXPECT_EQ(whole_movie::Probe(folder / "a.mkv")["format"]["tags"]["title"], "Das Programm");
+    ASSERT_EQ(Call({folder / "in.ts", folder / "a.ts", "-q"}).code, 0);
+    EXPECT_EQ(whole_movie::Probe(folder / "a.ts")["programs"][0]["tags"]["service_name"], "Das Programm");
+    const Result made = Call({whole_movie::Make(), folder / "b.ts", "--progress", "none"});
+    EXPECT_TRUE(Has(made.err,
+                    "not carried: label 0 (mpeg4, English): MPEG transport stream cannot hold its language"))
+        << made.err;
+}
+
+} // namespace
