@@ -10,16 +10,16 @@
 namespace writer {
 namespace {
 
-constexpr size_t kHeaderSize = 8;
+constexpr size_t kHeadSize = 8;
 
 /// Calls `take` with the type of each box from `begin` to `end`, and where its content begins and ends.
 template <class Take>
 void ForEachBox(uint8_t* begin, uint8_t* end, Take take) {
-    while (static_cast<size_t>(end - begin) >= kHeaderSize) {
+    while (static_cast<size_t>(end - begin) >= kHeadSize) {
         const auto size = static_cast<size_t>(BigEndian(begin, 4));
-        if (size < kHeaderSize || size > static_cast<size_t>(end - begin))
+        if (size < kHeadSize || size > static_cast<size_t>(end - begin))
             return;
-        take(reinterpret_cast<const char*>(begin + 4), begin + kHeaderSize, begin + size);
+        take(reinterpret_cast<const char*>(begin + 4), begin + kHeadSize, begin + size);
         begin += size;
     }
 }
@@ -68,7 +68,7 @@ uint8_t* Correct(uint8_t* begin, uint8_t* end, const Mp4Track& track, uint8_t*& 
             content[3] = static_cast<uint8_t>(content[3] & ~kEnabled);
         if (!Is(type, "mdia"))
             return;
-        media = content - kHeaderSize;
+        media = content - kHeadSize;
         ForEachBox(content, contentEnd, [&](const char* inner, uint8_t* head, uint8_t* headEnd) {
             if (!Is(inner, "mdhd"))
                 return;
@@ -82,7 +82,7 @@ uint8_t* Correct(uint8_t* begin, uint8_t* end, const Mp4Track& track, uint8_t*& 
 /// The track that begins at `at`. Returns by how much it became longer.
 size_t CorrectTrack(std::vector<uint8_t>& moov, size_t at, size_t size, const Mp4Track& track) {
     uint8_t* media = nullptr;
-    uint8_t* const place = Correct(&moov[at + kHeaderSize], moov.data() + at + size, track, media);
+    uint8_t* const place = Correct(&moov[at + kHeadSize], moov.data() + at + size, track, media);
     if (place == nullptr || track.languageTag.empty())
         return 0;
     const std::vector<uint8_t> box = LanguageBox(track.languageTag);
@@ -95,12 +95,12 @@ size_t CorrectTrack(std::vector<uint8_t>& moov, size_t at, size_t size, const Mp
 } // namespace
 
 void CorrectTracks(std::vector<uint8_t>& moov, const std::vector<Mp4Track>& tracks) {
-    if (moov.size() < kHeaderSize)
+    if (moov.size() < kHeadSize)
         return;
-    size_t at = kHeaderSize;
-    for (size_t next = 0; next < tracks.size() && at + kHeaderSize <= moov.size();) {
+    size_t at = kHeadSize;
+    for (size_t next = 0; next < tracks.size() && at + kHeadSize <= moov.size();) {
         const auto size = static_cast<size_t>(BigEndian(&moov[at], 4));
-        if (size < kHeaderSize || size > moov.size() - at)
+        if (size < kHeadSize || size > moov.size() - at)
             return;
         size_t added = 0;
         if (Is(reinterpret_cast<const char*>(&moov[at + 4]), "trak"))

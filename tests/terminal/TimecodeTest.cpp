@@ -16,7 +16,7 @@ using test_movies::CountedPictures;
 using test_movies::Join;
 
 /// Three seconds of which the first ends a minute: where numbers are left out, two are there.
-std::string Counted() {
+std::string WithTimecode() {
     return test_movies::Make("counted.mov", Join(CountedPictures(3, "30000/1001"),
                                                  Args{"-c:v", "mpeg4", "-timecode", "01:00:59;00"}));
 }
@@ -53,8 +53,8 @@ TEST(Timecode, IsMovedWithRangesAndClips) {
             if (format != "mp4" && !isAboutTheFormat)
                 continue;
             SCOPED_TRACE(format + " " + test.timecode);
-            const Result made = Call(
-                Join(Args{Counted(), folder / ("out." + format), "-y", "--progress", "none"}, test.options));
+            const Result made = Call(Join(
+                Args{WithTimecode(), folder / ("out." + format), "-y", "--progress", "none"}, test.options));
             EXPECT_EQ(made.code, 0);
             EXPECT_FALSE(Has(made.err, "not carried")) << made.err;
             const std::string file = folder / (test.file + ("." + format));
@@ -79,8 +79,9 @@ TEST(Timecode, IsToldWhereItCannotBe) {
         {"out.mp4", {"--metadata", "timecode=noon"}, "\"noon\" makes no sense"},
     };
     for (const auto& test : cases)
-        EXPECT_EQ(Call(Join(Args{Counted(), folder / test.name, "--progress", "none"}, test.options)).err,
-                  std::string("movieconv: not carried: timecode: ") + test.text + "\n");
+        EXPECT_EQ(
+            Call(Join(Args{WithTimecode(), folder / test.name, "--progress", "none"}, test.options)).err,
+            std::string("movieconv: not carried: timecode: ") + test.text + "\n");
 }
 
 } // namespace
