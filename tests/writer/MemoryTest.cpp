@@ -46,7 +46,7 @@ using Case = std::tuple<File, Phase, Lack>;
 /// ones.
 int64_t After(int64_t number) {
 #if defined(__SANITIZE_ADDRESS__) || defined(__SANITIZE_THREAD__)
-    constexpr int64_t kDensity = 4;
+    constexpr int64_t kDensity = 2;
 #else
     constexpr int64_t kDensity = 32;
 #endif

@@ -75,13 +75,13 @@ std::optional<Margins> MarginsOf(const QJsonValue& json) {
     return Margins{side(0), side(1), side(2), side(3)};
 }
 
-QString NameOf(Wishes::Hdr choice) {
+QString WordFor(Wishes::Hdr choice) {
     return choice == Wishes::Hdr::kKeep    ? QStringLiteral("keep")
            : choice == Wishes::Hdr::kUsual ? QStringLiteral("sdr")
                                            : QStringLiteral("auto");
 }
 
-QString NameOf(Wishes::Deinterlace choice) {
+QString WordFor(Wishes::Deinterlace choice) {
     return choice == Wishes::Deinterlace::kOff   ? QStringLiteral("off")
            : choice == Wishes::Deinterlace::kAll ? QStringLiteral("all")
                                                  : QStringLiteral("auto");
@@ -134,14 +134,14 @@ QJsonObject ToJson(const Wishes& wishes) {
     Put(json, "subtitles", wishes.subtitles);
     Put(json, "channels", wishes.channels);
     if (wishes.deinterlace != defaults.deinterlace)
-        json[QLatin1String("deinterlace")] = NameOf(wishes.deinterlace);
+        json[QLatin1String("deinterlace")] = WordFor(wishes.deinterlace);
     if (wishes.crop)
         json[QLatin1String("crop")] = true;
     if (wishes.cut)
         json[QLatin1String("cut")] =
             QJsonArray{wishes.cut->top, wishes.cut->bottom, wishes.cut->left, wishes.cut->right};
     if (wishes.hdr != defaults.hdr)
-        json[QLatin1String("hdr")] = NameOf(wishes.hdr);
+        json[QLatin1String("hdr")] = WordFor(wishes.hdr);
     Put(json, "depth", wishes.depth);
     PutTexts(json, wishes);
     if (!wishes.withPictures)
@@ -166,12 +166,12 @@ Wishes WishesFromJson(const QJsonObject& json) {
     wishes.subtitles = NumbersOf(json, "subtitles");
     wishes.channels = IntegerOf(json, "channels", 1, 8);
     for (const auto choice : {Wishes::Deinterlace::kOff, Wishes::Deinterlace::kAll})
-        if (json[QLatin1String("deinterlace")].toString() == NameOf(choice))
+        if (json[QLatin1String("deinterlace")].toString() == WordFor(choice))
             wishes.deinterlace = choice;
     wishes.crop = json[QLatin1String("crop")].toBool(false);
     wishes.cut = MarginsOf(json[QLatin1String("cut")]);
     for (const auto choice : {Wishes::Hdr::kKeep, Wishes::Hdr::kUsual})
-        if (json[QLatin1String("hdr")].toString() == NameOf(choice))
+        if (json[QLatin1String("hdr")].toString() == WordFor(choice))
             wishes.hdr = choice;
     wishes.depth = IntegerOf(json, "depth", 8, 10);
     wishes.subtitleFiles = SubtitleFilesOf(json[QLatin1String("subtitle_files")]);

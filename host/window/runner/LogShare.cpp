@@ -7,7 +7,7 @@ namespace {
 
 constexpr int kMostLines = 100;
 
-struct Texts {
+struct LogTexts {
     Q_DECLARE_TR_FUNCTIONS(LogShare)
 };
 
@@ -31,7 +31,7 @@ void LogShare::Take(LogWeight weight, const std::string& line) {
         if (!listener || reader.lines > kMostLines)
             continue;
         listener->OnNote(++reader.lines <= kMostLines ? text
-                                                      : Texts::tr("There is more, which is left out."));
+                                                      : LogTexts::tr("There is more, which is left out."));
     }
 }
 

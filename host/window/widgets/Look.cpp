@@ -159,8 +159,8 @@ void PrimaryButton::paintEvent(QPaintEvent*) {
     painter.drawText(rect(), Qt::AlignCenter | Qt::TextShowMnemonic, text());
 }
 
-SlimBar::SlimBar(int steps, int height) {
-    setRange(0, steps);
+SlimBar::SlimBar(int height) {
+    setRange(0, 1000);
     setTextVisible(false);
     setFixedHeight(height);
 }

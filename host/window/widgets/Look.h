@@ -42,11 +42,11 @@ protected:
     void paintEvent(QPaintEvent* event) override;
 };
 
-/// A progress bar without text and frame.
+/// A progress bar of 1000 steps, without text and frame.
 class SlimBar : public QProgressBar {
     Q_OBJECT
 public:
-    SlimBar(int steps, int height);
+    explicit SlimBar(int height);
 
 protected:
     void paintEvent(QPaintEvent* event) override;

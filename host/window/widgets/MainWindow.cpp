@@ -27,7 +27,6 @@
 namespace movieconv::window {
 namespace {
 
-constexpr int kSteps = 1000; // of the progress bar
 const QString kUriList = QStringLiteral("text/uri-list");
 const QString kInterrupted = QStringLiteral("interrupted");
 const QString kClosing = QStringLiteral("closing");
@@ -284,7 +283,7 @@ void MainWindow::ShowTotals() {
     if (text != totals_->text())
         totals_->setText(text);
     bar_->setVisible(dispatcher_.IsWorking());
-    bar_->setValue(static_cast<int>(std::lround(std::max(totals.fraction, 0.0) * kSteps)));
+    bar_->setValue(static_cast<int>(std::lround(std::max(totals.fraction, 0.0) * bar_->maximum())));
     setWindowTitle(dispatcher_.IsWorking() && totals.fraction >= 0
                        ? tr("%1 % – MovieConv").arg(static_cast<int>(totals.fraction * 100))
                        : tr("MovieConv"));

@@ -22,7 +22,6 @@
 namespace movieconv::window {
 namespace {
 
-constexpr int kSteps = 1000; // of the progress bar
 constexpr int kListWidth = 380;
 
 class BigSign : public QWidget {
@@ -217,7 +216,7 @@ QWidget* MainWindow::MakeWorkspace() {
 QWidget* MainWindow::MakeFoot() {
     totals_ = new QLabel;
     totals_->setAccessibleName(tr("How the queue stands"));
-    bar_ = new SlimBar(kSteps, 5);
+    bar_ = new SlimBar(5);
     bar_->setAccessibleName(tr("Progress of the queue"));
     auto* open = new QPushButton(IconOf(Sign::kAdd), tr("A&dd movies…"));
     open->setObjectName(QStringLiteral("addButton"));

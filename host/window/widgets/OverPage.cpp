@@ -13,9 +13,9 @@
 namespace movieconv::window {
 namespace {
 
-constexpr int kSignSize = 44;
+constexpr int kOutcomeSignSize = 44;
 
-Sign SignOf(State state) {
+Sign OutcomeSignOf(State state) {
     return state == State::kDone      ? Sign::kDone
            : state == State::kStopped ? Sign::kStop
            : state == State::kFailed  ? Sign::kWarning
@@ -29,7 +29,7 @@ QColor ColourOf(State state, const QPalette& palette) {
 }
 
 QPixmap SignPicture(State state, const QPalette& palette, qreal ratio) {
-    QPixmap pixmap(QSize(kSignSize, kSignSize) * ratio);
+    QPixmap pixmap(QSize(kOutcomeSignSize, kOutcomeSignSize) * ratio);
     pixmap.setDevicePixelRatio(ratio);
     pixmap.fill(Qt::transparent);
     QPainter painter(&pixmap);
@@ -38,8 +38,8 @@ QPixmap SignPicture(State state, const QPalette& palette, qreal ratio) {
     ground.setAlpha(38);
     painter.setPen(Qt::NoPen);
     painter.setBrush(ground);
-    painter.drawEllipse(0, 0, kSignSize, kSignSize);
-    PaintSign(painter, SignOf(state), QRectF(12, 12, kSignSize - 24, kSignSize - 24),
+    painter.drawEllipse(0, 0, kOutcomeSignSize, kOutcomeSignSize);
+    PaintSign(painter, OutcomeSignOf(state), QRectF(12, 12, kOutcomeSignSize - 24, kOutcomeSignSize - 24),
               ColourOf(state, palette));
     return pixmap;
 }

@@ -17,8 +17,6 @@
 namespace movieconv::window {
 namespace {
 
-constexpr int kSteps = 1000; // of the progress bar
-
 void SetText(QLabel& label, const QString& text) {
     if (label.text() != text)
         label.setText(text);
@@ -60,7 +58,7 @@ WorkPage::WorkPage(QWidget* parent)
       picture_(new PictureView),
       phase_(MakeHint()),
       percent_(MakeTitle({}, 2.0, true)),
-      bar_(new SlimBar(kSteps, 8)),
+      bar_(new SlimBar(8)),
       pause_(new QPushButton),
       stop_(new QPushButton(IconOf(Sign::kStop), tr("S&top"))),
       log_(new LogPanel) {
@@ -132,7 +130,7 @@ void WorkPage::Show(const Entry& entry) {
     percent_->setVisible(known);
     bar_->setVisible(known);
     if (known)
-        bar_->setValue(static_cast<int>(std::lround(figures.fraction * kSteps)));
+        bar_->setValue(static_cast<int>(std::lround(figures.fraction * bar_->maximum())));
     SetText(*left_, figures.left ? LeftText(*figures.left) : unknown);
     SetText(*speed_, figures.speed ? SpeedText(*figures.speed) : unknown);
     SetText(*position_, figures.length > 0
