@@ -285,10 +285,18 @@ Carried CarryOver(Movie& movie, const Request& request, const FileFormatInfo& fo
     std::vector<NotCarried>& left = carried.left;
     if (std::optional<NotCarried> chapters = WhyChaptersStay(source, request, format))
         left.push_back(*std::move(chapters));
-    else if (!request.noChapters)
+    else if (!request.noChapters) {
+        if (source.unreadChapters > 0)
+            left.push_back(
+                {"chapters",
+                 std::nullopt,
+                 {},
+                 {},
+                 fmt::format("{} of them are in other editions or within others", source.unreadChapters)});
         if (const int wrong = CarryChapters(source, request, format, writerSet); wrong != 0)
             left.push_back(
                 {"chapters", std::nullopt, {}, {}, fmt::format("{} of them have no length", wrong)});
+    }
     if (std::optional<NotCarried> timecode = WhyTimecodeStays(source, request, format))
         left.push_back(*std::move(timecode));
     FurtherTracks tracks(movie, request, format, writerSet);

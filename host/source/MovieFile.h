@@ -5,8 +5,8 @@
 #include "ffmpeg/AvHandles.h"
 #include "host/source/CompanionFiles.h"
 #include "host/source/Completeness.h"
+#include "host/source/ContainerNotes.h"
 #include "host/source/InputFile.h"
-#include "host/source/LanguageTags.h"
 
 #include <cstdint>
 #include <memory>
@@ -38,8 +38,8 @@ public:
     /// Whether the file promises more than it holds.
     bool IsCutOff() const { return movieconv::IsCutOff(bytes_, *input_); }
 
-    /// As ReadLanguageTags.
-    std::vector<std::string> LanguageTags() const { return ReadLanguageTags(bytes_, *input_); }
+    /// What it says and FFmpeg does not read.
+    ContainerNotes Notes() const { return ReadContainerNotes(bytes_, *input_); }
 
     /// Why a file that the source names was not read; empty when all were.
     const std::string& Refusal() const { return companions_.Refusal(); }

@@ -4,11 +4,17 @@
 #include "host/source/Probe.h"
 #include "host/source/StreamChoice.h"
 #include "host/source/StreamDescription.h"
+#include "host/source/SubtitleFile.h"
 
+#include <algorithm>
 #include <cstddef>
 #include <fmt/format.h>
 #include <utility>
 #include <vector>
+
+extern "C" {
+#include <libavutil/avstring.h>
+}
 
 namespace movieconv {
 namespace {
@@ -21,15 +27,24 @@ std::string NothingToConvert(const std::string& path, const SourceChoice& choice
 }
 
 /// Where the container tells more than FFmpeg reads.
-void SetLanguages(const std::vector<std::string>& tags, std::vector<StreamInfo>& streams) {
-    for (std::size_t i = 0; i < streams.size(); ++i) {
-        const std::string& tag = tags[i];
+void TakeNotes(const ContainerNotes& notes, SourceInfo& info) {
+    for (std::size_t i = 0; i < info.streams.size(); ++i) {
+        StreamInfo& stream = info.streams[i];
+        const std::string& tag = notes.streams[i].languageTag;
         const std::string language = ThreeLetters(tag.substr(0, tag.find('-')));
-        if (language.size() == 3 && language != ThreeLetters(streams[i].language))
-            streams[i].language = language;
-        if (tag.find('-') != std::string::npos)
-            streams[i].languageTag = tag;
+        if (LanguageName(language) != language) // it is a known one
+            stream.language = language != ThreeLetters(stream.language) ? language : stream.language;
+        if (tag.find('-') != std::string::npos || language != ThreeLetters(stream.language))
+            stream.languageTag = tag;
+        if (stream.title.empty())
+            stream.title = ToUtf8(notes.streams[i].title, "");
     }
+    const auto title = std::find_if(info.tags.begin(), info.tags.end(), [](const Tag& tag) {
+        return av_strcasecmp(tag.key.c_str(), "title") == 0;
+    });
+    if (!notes.title.empty() && title != info.tags.end())
+        title->value = ToUtf8(notes.title, "");
+    info.unreadChapters = std::max(notes.chapters - static_cast<int>(info.chapters.size()), 0);
 }
 
 } // namespace
@@ -43,9 +58,9 @@ Source::Source(const std::string& path, const SourceChoice& choice,
     info_.container =
         context.iformat->long_name != nullptr ? context.iformat->long_name : context.iformat->name;
     info_.streams = DescribeStreams(context, reader_.Start());
-    SetLanguages(reader_.File().LanguageTags(), info_.streams);
     info_.chapters = DescribeChapters(context, reader_.Start());
     info_.tags = DescribeTags(context.metadata);
+    TakeNotes(reader_.File().Notes(), info_);
     const ChosenStreams chosen = ChooseStreams(info_.streams, choice);
     WantedTracks(info_.streams, StreamKind::kSubtitles, choice.subtitles); // throws
     std::vector<int> selected;

@@ -138,7 +138,8 @@ struct SourceInfo {
     Certainty certainty = Certainty::kKnown; ///< Of `duration`.
     std::vector<StreamInfo> streams;         ///< All of them, in the container's order.
     std::vector<Chapter> chapters;
-    std::vector<Tag> tags; ///< What people wrote about the movie.
+    int unreadChapters = 0; ///< Others, of further editions or within these.
+    std::vector<Tag> tags;  ///< What people wrote about the movie.
 
     std::optional<PictureStreamInfo> pictures; ///< The stream that is converted, probed.
     std::optional<SoundStreamInfo> sound;

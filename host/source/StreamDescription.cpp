@@ -47,6 +47,23 @@ std::vector<Tag> TagsWithout(const AVDictionary* metadata, std::string_view left
     return tags;
 }
 
+/// "location" for QuickTime's long name of it, where nothing else has that name.
+std::string UsualKey(const AVDictionary& metadata, const std::string& key) {
+    constexpr std::string_view kQuickTime = "com.apple.quicktime.";
+    constexpr std::string_view kPlaceForm = ".ISO6709";
+    constexpr std::array<std::string_view, 11> kUsual{"title",     "artist",      "author", "album",
+                                                      "comment",   "description", "genre",  "keywords",
+                                                      "copyright", "make",        "model"};
+    if (key.compare(0, kQuickTime.size(), kQuickTime) != 0)
+        return key;
+    std::string rest = key.substr(kQuickTime.size());
+    const bool isPlace = rest == "location" + std::string(kPlaceForm);
+    if (isPlace)
+        rest = "location";
+    const bool isUsual = isPlace || std::find(kUsual.begin(), kUsual.end(), rest) != kUsual.end();
+    return isUsual && av_dict_get(&metadata, rest.c_str(), nullptr, 0) == nullptr ? rest : key;
+}
+
 bool IsUsual(AVRational rate) {
     constexpr double kUsualFrameRate = 200; // a higher one may be an artefact of the container's clock
     return rate.num > 0 && rate.den > 0 && av_q2d(rate) <= kUsualFrameRate;
@@ -278,7 +295,7 @@ std::vector<Tag> DescribeTags(const AVDictionary* metadata) {
     const AVDictionaryEntry* entry = nullptr;
     while ((entry = av_dict_get(metadata, "", entry, AV_DICT_IGNORE_SUFFIX)) != nullptr)
         if (!IsNote(entry->key))
-            tags.push_back({ToUtf8(entry->key, ""), ToUtf8(entry->value, "")});
+            tags.push_back({UsualKey(*metadata, ToUtf8(entry->key, "")), ToUtf8(entry->value, "")});
     return tags;
 }
 

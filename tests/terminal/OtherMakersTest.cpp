@@ -73,22 +73,22 @@ TEST(OtherMakers, LanguagesKeepTheirRegions) {
         GTEST_SKIP() << "without mkvmerge";
     const Folder folder;
     Args inputs = CountedPictures(1);
-    for (int i = 0; i < 3; ++i)
+    for (int i = 0; i < 4; ++i)
         inputs = Join(inputs, Args{"-f", "lavfi", "-i", "sine=d=1"});
     ASSERT_EQ(program::Run(Join(Args{"ffmpeg", "-v", "error"}, inputs,
-                                Args{"-map", "0", "-map", "1", "-map", "2", "-map", "3", "-c:v", "mpeg4",
-                                     "-c:a", "flac", folder / "plain.mkv"}))
+                                Args{"-map", "0", "-map", "1", "-map", "2", "-map", "3", "-map", "4", "-c:v",
+                                     "mpeg4", "-c:a", "flac", folder / "plain.mkv"}))
                   .code,
               0);
     ASSERT_EQ(program::Run({"mkvmerge", "-q", "-o", folder / "in.mkv", "--language", "0:und", "--language",
-                            "1:pt-BR", "--language", "2:zh-Hans", "--language", "3:de", folder / "plain.mkv"})
+                            "1:pt-BR", "--language", "2:zh-Hans", "--language", "3:de", "--language", "4:yue",
+                            folder / "plain.mkv"})
                   .code,
               0);
     const struct {
-        const char* track;
         const char* language;
-        const char* tag;
-    } expected[] = {{"1", "por", "pt-BR"}, {"2", "chi", "zh-Hans"}, {"3", "ger", "de"}};
+        const char* tag; // empty where it says no more
+    } expected[] = {{"por", "pt-BR"}, {"chi", "zh-Hans"}, {"ger", ""}, {"chi", "yue"}};
     std::string from = "in.mkv";
     for (const std::string name : {"a.mkv", "b.mp4", "c.mov", "d.mkv"}) { // each of the one before
         SCOPED_TRACE(name);
@@ -97,10 +97,9 @@ TEST(OtherMakers, LanguagesKeepTheirRegions) {
         EXPECT_EQ(made.err, "");
         const Json info = Json::parse(Call({"--info", folder / name, "--progress", "json"}).out);
         const Json probe = whole_movie::Probe(folder / name);
-        for (size_t i = 1; i < 4; ++i) {
+        for (size_t i = 1; i < 5; ++i) {
             EXPECT_EQ(probe["streams"][i]["tags"]["language"], expected[i - 1].language);
-            const std::string tag = expected[i - 1].tag;
-            EXPECT_EQ(info["streams"][i]["language_tag"], tag == "de" ? "" : tag);
+            EXPECT_EQ(info["streams"][i]["language_tag"], expected[i - 1].tag);
             EXPECT_EQ(program::Run({"ffmpeg", "-v", "error", "-i", folder / name, "-f", "null", "-"}).err,
                       "");
         }
@@ -109,8 +108,8 @@ TEST(OtherMakers, LanguagesKeepTheirRegions) {
     for (const char* name : {"a.mkv", "d.mkv"}) {
         const Json read = whole_movie::Identify(folder / name);
         EXPECT_TRUE(read["warnings"].empty() && read["errors"].empty()) << read;
-        for (size_t i = 1; i < 3; ++i)
-            EXPECT_EQ(read["tracks"][i]["properties"]["language_ietf"], expected[i - 1].tag);
+        for (size_t i = 1; i < 5; ++i)
+            EXPECT_EQ(read["tracks"][i]["properties"].value("language_ietf", ""), expected[i - 1].tag);
     }
     EXPECT_TRUE(Has(
         Call({folder / "in.mkv", folder / "out.ts", "--progress", "none"}).err,
@@ -132,6 +131,62 @@ TEST(OtherMakers, ABroadcastServiceIsATitle) {
     EXPECT_TRUE(Has(made.err,
                     "not carried: label 0 (mpeg4, English): MPEG transport stream cannot hold its language"))
         << made.err;
+}
+
+/// Titles of tracks in MP4, and long names of texts, as telephones write them.
+TEST(OtherMakers, TextsOfMp4AreFoundWhereverTheyAre) {
+    const Folder folder;
+    ASSERT_EQ(Call({whole_movie::Make(), folder / "a.mp4", "-q"}).code, 0);
+    ASSERT_EQ(Call({folder / "a.mp4", folder / "b.mkv", "-q"}).code, 0);
+    const Json streams = whole_movie::Probe(folder / "b.mkv")["streams"];
+    const char* titles[] = {"View", "Deutsch", "Comments", "", "Texte", "Signs"};
+    for (size_t i = 0; i < std::size(titles); ++i)
+        EXPECT_EQ(streams[i]["tags"].value("title", ""), titles[i]);
+    ASSERT_EQ(
+        program::Run(Join(Args{"ffmpeg", "-v", "error"}, CountedPictures(1),
+                          Args{"-c:v", "mpeg4", "-movflags", "use_metadata_tags", "-metadata",
+                               "com.apple.quicktime.location.ISO6709=+48.1+011.6/", folder / "phone.mov"}))
+            .code,
+        0);
+    EXPECT_EQ(Call({folder / "phone.mov", folder / "phone.mp4", "--progress", "none"}).err, "");
+    EXPECT_EQ(whole_movie::Probe(folder / "phone.mp4")["format"]["tags"].value("location", ""),
+              "+48.1000+011.6000/");
+}
+
+/// A title that a tag hides, and chapters that FFmpeg does not read.
+TEST(OtherMakers, MatroskaTitlesAndChapters) {
+    if (program::Run({"sh", "-c", "command -v mkvmerge"}).code != 0)
+        GTEST_SKIP() << "without mkvmerge";
+    constexpr char kXml[] = "<?xml version=\"1.0\"?>";
+    const Folder folder;
+    const auto chapter = [](const char* begin, const char* end, const std::string& within) {
+        return std::string("<ChapterAtom><ChapterTimeStart>00:00:00.") + begin +
+               "</ChapterTimeStart><ChapterTimeEnd>00:00:00." + end +
+               "</ChapterTimeEnd><ChapterDisplay><ChapterString>A</ChapterString></ChapterDisplay>" + within +
+               "</ChapterAtom>";
+    };
+    WriteFile(folder / "chapters.xml", std::string(kXml) + "<Chapters><EditionEntry>" +
+                                           chapter("000", "500", chapter("100", "200", "")) +
+                                           chapter("500", "900", "") + "</EditionEntry><EditionEntry>" +
+                                           chapter("300", "400", "") + "</EditionEntry></Chapters>");
+    WriteFile(folder / "tags.xml",
+              std::string(kXml) +
+                  "<Tags><Tag><Targets><TargetTypeValue>70</TargetTypeValue></Targets><Simple>"
+                  "<Name>TITLE</Name><String>The series</String></Simple></Tag></Tags>");
+    ASSERT_EQ(program::Run(Join(Args{"ffmpeg", "-v", "error"}, CountedPictures(1),
+                                Args{"-c:v", "mpeg4", folder / "plain.mkv"}))
+                  .code,
+              0);
+    ASSERT_EQ(
+        program::Run({"mkvmerge", "-q", "-o", folder / "in.mkv", "--title", "The movie", "--global-tags",
+                      folder / "tags.xml", "--chapters", folder / "chapters.xml", folder / "plain.mkv"})
+            .code,
+        0);
+    EXPECT_EQ(Call({folder / "in.mkv", folder / "out.mkv", "--progress", "none"}).err,
+              "movieconv: not carried: chapters: 2 of them are in other editions or within others\n");
+    const Json probe = whole_movie::Probe(folder / "out.mkv");
+    EXPECT_EQ(probe["format"]["tags"].value("title", ""), "The movie");
+    EXPECT_EQ(probe["chapters"].size(), 2);
 }
 
 } // namespace

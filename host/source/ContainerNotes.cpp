@@ -1,4 +1,4 @@
-#include "host/source/LanguageTags.h"
+#include "host/source/ContainerNotes.h"
 
 #include <algorithm>
 #include <array>
@@ -99,18 +99,15 @@ public:
         return found;
     }
 
-    /// What is in a part, but for `skip` bytes; empty when it is no tag.
-    std::string Tag(const Part& part, int64_t skip) const {
-        std::array<char, 36> text{}; // a tag has 35 characters at most
-        const auto size = std::min<int64_t>(part.end - part.begin - skip, text.size() - 1);
-        if (size <= 0 || file_.ReadAt(part.begin + skip, reinterpret_cast<uint8_t*>(text.data()),
-                                      static_cast<std::size_t>(size)) != size)
+    /// What is in a part, but for `skip` bytes; empty when there is more than `most`.
+    std::string Text(const Part& part, int64_t skip, int64_t most) const {
+        const int64_t size = part.end - part.begin - skip;
+        if (size <= 0 || size > most)
             return {};
-        std::string tag(text.data());
-        const bool isTag = std::all_of(tag.begin(), tag.end(), [](unsigned char letter) {
-            return letter == '-' || (letter < 0x80 && std::isalnum(letter) != 0);
-        });
-        return isTag && tag != "und" ? tag : std::string();
+        std::string text(static_cast<std::size_t>(size), '\0');
+        if (file_.ReadAt(part.begin + skip, reinterpret_cast<uint8_t*>(text.data()), text.size()) != size)
+            return {};
+        return text.substr(0, text.find('\0'));
     }
 
     int Number(const Part& part) const {
@@ -131,52 +128,91 @@ constexpr uint64_t BoxName(std::string_view name) {
     return number;
 }
 
-std::vector<std::string> OfMp4(const InputFile& file) {
-    std::vector<std::string> tags;
+constexpr int64_t kLongestTag = 36; // with its end
+constexpr int64_t kLongestTitle = 4096;
+
+/// Empty for what is no language.
+std::string TagFrom(const std::string& text) {
+    const bool isTag = std::all_of(text.begin(), text.end(), [](unsigned char letter) {
+        return letter == '-' || (letter < 0x80 && std::isalnum(letter) != 0);
+    });
+    return isTag && text != "und" ? text : std::string();
+}
+
+ContainerNotes OfMp4(const InputFile& file) {
+    constexpr int64_t kVersionAndFlags = 4;
+    ContainerNotes notes;
     Parts boxes(file, ReadBox);
     boxes.ForEach(boxes.Find(boxes.Whole(), BoxName("moov")), [&](const Part& track) {
         if (track.name != BoxName("trak"))
             return true;
-        constexpr int64_t kVersionAndFlags = 4;
-        const Part media = boxes.Find(track, BoxName("mdia"));
-        tags.push_back(boxes.Tag(boxes.Find(media, BoxName("elng")), kVersionAndFlags));
+        const Part language = boxes.Find(boxes.Find(track, BoxName("mdia")), BoxName("elng"));
+        const Part title = boxes.Find(boxes.Find(track, BoxName("udta")), BoxName("name"));
+        notes.streams.push_back(
+            {TagFrom(boxes.Text(language, kVersionAndFlags, kLongestTag + kVersionAndFlags)),
+             boxes.Text(title, 0, kLongestTitle)});
         return true;
     });
-    return tags;
+    return notes;
 }
 
-std::vector<std::string> OfMatroska(const InputFile& file) {
+/// Those in `whole`, an edition or a chapter.
+int CountChapters(Parts& elements, const Part& whole, int depth) {
+    constexpr uint64_t kChapter = 0xB6;
+    constexpr int kDeepest = 8;
+    int count = 0;
+    if (depth < kDeepest)
+        elements.ForEach(whole, [&](const Part& part) {
+            count += part.name == kChapter ? 1 + CountChapters(elements, part, depth + 1) : 0;
+            return true;
+        });
+    return count;
+}
+
+/// What stands in front of the packets.
+ContainerNotes OfMatroska(const InputFile& file) {
     constexpr uint64_t kSegment = 0x18538067;
     constexpr uint64_t kCluster = 0x1F43B675;
+    constexpr uint64_t kInfo = 0x1549A966;
+    constexpr uint64_t kTitle = 0x7BA9;
     constexpr uint64_t kTracks = 0x1654AE6B;
     constexpr uint64_t kTrack = 0xAE;
     constexpr uint64_t kType = 0x83;
     constexpr uint64_t kLanguage = 0x22B59D;
+    constexpr uint64_t kChapters = 0x1043A770;
+    constexpr uint64_t kEdition = 0x45B9;
     constexpr std::array kTypes{1, 2, 0x11, 0x21}; // of those that become streams
-    std::vector<std::string> tags;
+    ContainerNotes notes;
     Parts elements(file, ReadElement);
     const Part segment = elements.Find(elements.Whole(), kSegment);
+    notes.title =
+        elements.Text(elements.Find(elements.Find(segment, kInfo, kCluster), kTitle), 0, kLongestTitle);
     elements.ForEach(elements.Find(segment, kTracks, kCluster), [&](const Part& track) {
         const int type = track.name == kTrack ? elements.Number(elements.Find(track, kType)) : 0;
         if (std::find(kTypes.begin(), kTypes.end(), type) != kTypes.end())
-            tags.push_back(elements.Tag(elements.Find(track, kLanguage), 0));
+            notes.streams.push_back(
+                {TagFrom(elements.Text(elements.Find(track, kLanguage), 0, kLongestTag)), {}});
         return true;
     });
-    return tags;
+    elements.ForEach(elements.Find(segment, kChapters, kCluster), [&](const Part& edition) {
+        notes.chapters += edition.name == kEdition ? CountChapters(elements, edition, 0) : 0;
+        return true;
+    });
+    return notes;
 }
 
 } // namespace
 
-std::vector<std::string> ReadLanguageTags(const InputFile& file, const AVFormatContext& context) {
-    std::vector<std::string> tags;
+ContainerNotes ReadContainerNotes(const InputFile& file, const AVFormatContext& context) {
+    ContainerNotes notes;
     if (av_match_name("matroska", context.iformat->name) != 0)
-        tags = OfMatroska(file);
+        notes = OfMatroska(file);
     else if (av_match_name("mov", context.iformat->name) != 0)
-        tags = OfMp4(file);
-    if (tags.size() > context.nb_streams) // streams and tracks do not belong to each other
-        tags.clear();
-    tags.resize(context.nb_streams); // covers and attached files follow the tracks
-    return tags;
+        notes = OfMp4(file);
+    if (notes.streams.size() > context.nb_streams) // streams and tracks do not belong to each other
+        notes.streams.clear();
+    notes.streams.resize(context.nb_streams); // covers and attached files follow the tracks
+    return notes;
 }
 
 } // namespace movieconv
