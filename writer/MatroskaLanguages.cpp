@@ -115,12 +115,12 @@ std::string LanguagePlace(const TrackLabel& label) {
 }
 
 int PutLanguageTags(ByteFile& file, const std::vector<const TrackLabel*>& labels) {
-    constexpr size_t kMostHead = 8 << 20; // tracks bring headers of their codecs
+    constexpr int64_t kMostHead = 8 << 20; // tracks bring headers of their codecs
     const int64_t position = file.Seek(0, SEEK_CUR);
     const int64_t size = file.Seek(0, SEEK_END);
     if (position < 0 || size < 0)
         return EIO;
-    std::string head(std::min(kMostHead, static_cast<size_t>(size)), '\0');
+    std::string head(static_cast<size_t>(std::min(kMostHead, size)), '\0');
     int64_t result = ReadHead(file, head);
     const Range tracks = FindTracks(head);
     if (result >= 0 && tracks.end > tracks.begin) {

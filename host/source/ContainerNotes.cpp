@@ -44,7 +44,7 @@ bool ReadBox(const InputFile& file, int64_t at, int64_t end, Part& part) {
 }
 
 /// A number of 1 to 8 bytes, of which the zeros in front tell how many. Its bytes; 0 when it makes no sense.
-int ReadNumber(const uint8_t* bytes, int most, bool keepMark, uint64_t& number) {
+int ReadMarked(const uint8_t* bytes, int most, bool keepMark, uint64_t& number) {
     int length = 1;
     while (length <= most && (bytes[0] & (0x80 >> (length - 1))) == 0)
         ++length;
@@ -61,8 +61,8 @@ bool ReadElement(const InputFile& file, int64_t at, int64_t end, Part& part) {
     if (file.ReadAt(at, head.data(), head.size()) < 2)
         return false;
     uint64_t size = 0;
-    const int nameLength = ReadNumber(head.data(), 4, true, part.name);
-    const int sizeLength = nameLength > 0 ? ReadNumber(head.data() + nameLength, 8, false, size) : 0;
+    const int nameLength = ReadMarked(head.data(), 4, true, part.name);
+    const int sizeLength = nameLength > 0 ? ReadMarked(head.data() + nameLength, 8, false, size) : 0;
     if (sizeLength == 0)
         return false;
     part.begin = at + nameLength + sizeLength;

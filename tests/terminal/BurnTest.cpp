@@ -174,6 +174,53 @@ TEST(Burn, TakesFilesAndTheFontsOfTheSource) {
     EXPECT_GT(width(true), width(false) * 3 / 2);
 }
 
+/// Text in HDR pictures is as bright as a white page, and leaves the rest as it is.
+TEST(Burn, WhiteIsThatOfAPageInHdr) {
+    const Folder folder;
+    WriteFile(folder / "words.srt", "1\n00:00:00,000 --> 00:00:01,000\nWORDS\n");
+    constexpr int kWidth = 640;
+    constexpr int kHeight = 480;
+    constexpr int kBackground = 200;
+    const struct {
+        const char* transfer;
+        int white; // of 10 bits
+    } cases[] = {{"smpte2084", 64 + 876 * 58 / 100}, {"arib-std-b67", 64 + 876 * 75 / 100}};
+    for (const auto& test : cases) {
+        SCOPED_TRACE(test.transfer);
+        ASSERT_EQ(program::Run({"ffmpeg", "-v", "error", "-y", "-f", "lavfi", "-i",
+                                "color=black:s=640x480:r=5:d=0.4,format=yuv420p10,geq=lum=" +
+                                    std::to_string(kBackground) + ":cb=512:cr=512",
+                                "-c:v", "ffv1", "-color_primaries", "bt2020", "-color_trc", test.transfer,
+                                "-colorspace", "bt2020nc", folder / "hdr.mkv"})
+                      .code,
+                  0);
+        const Result made = Call({folder / "hdr.mkv", folder / "out.mkv", "--burn-subtitles",
+                                  folder / "words.srt", "--video-codec", "FFV1", "-y", "-q"});
+        ASSERT_EQ(made.code, 0) << made.err;
+        EXPECT_TRUE(Has(program::Run({"ffprobe", "-v", "error", "-show_entries", "stream=color_transfer",
+                                      folder / "out.mkv"})
+                            .out,
+                        test.transfer));
+        const std::string picture =
+            program::Run({"ffmpeg", "-v", "error", "-i", folder / "out.mkv", "-frames:v", "1", "-f",
+                          "rawvideo", "-pix_fmt", "yuv420p10le", "-"})
+                .out;
+        ASSERT_EQ(picture.size(), kWidth * kHeight * 3);
+        const auto luma = [&](size_t pixel) {
+            return static_cast<unsigned char>(picture[2 * pixel]) |
+                   static_cast<unsigned char>(picture[2 * pixel + 1]) << 8;
+        };
+        int brightest = 0;
+        for (size_t pixel = 0; pixel < size_t{kWidth} * kHeight; ++pixel) {
+            brightest = std::max(brightest, luma(pixel));
+            if (pixel < size_t{kWidth} * kHeight * 2 / 3) {
+                ASSERT_EQ(luma(pixel), kBackground);
+            }
+        }
+        EXPECT_NEAR(brightest, test.white, 6);
+    }
+}
+
 TEST(Burn, LeavesTheTrackOutUnlessItIsAskedFor) {
     const Folder folder;
     const auto texts = [&](const Args& options) {
