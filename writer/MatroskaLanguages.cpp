@@ -75,8 +75,8 @@ void Renew(std::string& content) {
     const auto* bytes = reinterpret_cast<const uint8_t*>(content.data());
     const uint32_t sum =
         ~av_crc(av_crc_get_table(AV_CRC_32_IEEE_LE), UINT32_MAX, bytes + kSumSize, content.size() - kSumSize);
-    for (int i = 0; i < 4; ++i)
-        content[static_cast<size_t>(2 + i)] = static_cast<char>(sum >> (8 * i) & 0xFF);
+    for (size_t i = 0; i < 4; ++i)
+        content[2 + i] = static_cast<char>(sum >> (8 * i) & 0xFF);
 }
 
 int64_t ReadHead(ByteFile& file, std::string& head) {
