@@ -65,7 +65,7 @@ struct Killed {
 std::vector<std::string> Times(const std::string& path) {
     std::vector<std::string> lines = packets::Of(path);
     for (std::string& line : lines)
-        line.resize(std::min(line.find(" holds "), line.size()));
+        line.resize(std::min(line.find(" skips "), line.size()));
     return lines;
 }
 
