@@ -20,7 +20,8 @@ SourceChoice ChoiceOf(const Request& request) {
             .deinterlace = request.deinterlace,
             .stampsOnly = request.piece && !request.piece->pictures,
             .fromStart = request.piece && request.piece->fromStart,
-            .playlists = request.playlists};
+            .playlists = request.playlists,
+            .untilNow = request.piece.has_value()};
 }
 
 /// ChoiceOf with what is to be cropped. Throws SourceError.

@@ -3,7 +3,7 @@
 #include "host/convert/EncodePlan.h"
 #include "host/convert/Failure.h"
 #include "host/convert/Sources.h"
-#include "host/pieces/SettingsText.h"
+#include "host/pieces/CheckedLine.h"
 
 #include <algorithm>
 #include <filesystem>
@@ -53,6 +53,15 @@ void Replace(std::string& text, const std::string& what, const std::string& by) 
         text.replace(at, what.size(), by);
 }
 
+/// Everything but the source that decides what comes out.
+std::string SettingsOf(Request request) {
+    const std::vector<SourceMark> texts = MarkTexts(request);
+    Json settings = WishesAsJson(request);
+    settings["texts"] = MarksAsJson(texts);
+    settings["madeWith"] = CurrentVersions();
+    return AsText(settings);
+}
+
 /// One movie being converted.
 class MovieErrand final : public Errand {
 public:
@@ -85,14 +94,12 @@ Batch::Batch(BatchOrder order, Observer& observer, Loop loop)
     : Crew(observer, std::move(loop)), order_(std::move(order)) {}
 
 Verdict Batch::Perform() {
+    settings_ = SettingsOf(order_.request);
     std::error_code error;
     fs::create_directories(order_.folder, error);
     if (error)
         throw Failure(Category::kOutput,
                       fmt::format("the folder \"{}\" cannot be made: {}", order_.folder, error.message()));
-    Json settings = WishesAsJson(order_.request);
-    settings["madeWith"] = CurrentVersions();
-    settings_ = settings.dump(-1, ' ', false, Json::error_handler_t::replace);
     journal_.emplace(order_.folder);
     if (journal_->Damaged() > 0)
         News().Warned({Warning::Kind::kSource,
@@ -100,7 +107,7 @@ Verdict Batch::Perform() {
                                    journal_->Damaged(), order_.folder)});
     List();
     count_ = static_cast<int>(waiting_.size());
-    News().Started({fmt::format("{} movies", count_), order_.folder, 0, false});
+    News().Started({fmt::format("{} {}", count_, count_ == 1 ? "movie" : "movies"), order_.folder, 0, false});
     const auto processors = static_cast<int>(std::max(1U, std::thread::hardware_concurrency()));
     WorkOff(order_.jobs > 0 ? order_.jobs : (processors + 1) / 2);
     return Conclude();

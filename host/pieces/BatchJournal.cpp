@@ -1,12 +1,13 @@
 #include "host/pieces/BatchJournal.h"
 
 #include "host/convert/Failure.h"
+#include "host/pieces/CheckedLine.h"
 #include "host/pieces/Digest.h"
-#include "host/pieces/SettingsText.h"
 #include "host/pieces/WholeFile.h"
+#include "text/Path.h"
 
-#include <filesystem>
 #include <fmt/format.h>
+#include <sstream>
 #include <unistd.h>
 
 namespace movieconv {
@@ -23,15 +24,6 @@ std::string TaskOf(const SourceMark& source, const std::string& settings) {
     return DigestOf(HashOf(source) + "\n" + settings);
 }
 
-std::string NameOf(const std::string& path) {
-    return std::filesystem::path(path).filename().string();
-}
-
-std::string CheckOf(const std::string& state, const std::string& output, const std::string& task,
-                    const std::string& result) {
-    return DigestOf(fmt::format("{}\n{}\n{}\n{}", state, output, task, result));
-}
-
 } // namespace
 
 BatchJournal::BatchJournal(const std::string& folder) : path_(folder + "/movieconv.journal") {
@@ -40,20 +32,13 @@ BatchJournal::BatchJournal(const std::string& folder) : path_(folder + "/movieco
 }
 
 void BatchJournal::Read(const std::string& text) {
-    for (std::size_t at = 0; at < text.size();) {
-        const std::size_t end = std::min(text.find('\n', at), text.size());
-        const Json line = Json::parse(text.substr(at, end - at), nullptr, false);
-        at = end + 1;
-        const auto part = [&line](const char* name) {
-            return line.is_object() && line.contains(name) && line.at(name).is_string()
-                       ? line.at(name).get<std::string>()
-                       : std::string();
-        };
-        const std::string output = part("output");
-        const Entry entry{part("state") == "done", part("task"), part("result")};
-        if (part("check") == CheckOf(part("state"), output, entry.task, entry.result))
-            entries_[output] = entry;
-        else
+    std::istringstream lines(text);
+    for (std::string line; std::getline(lines, line);) {
+        const std::optional<Json> entry = ObjectOn(line);
+        const auto part = [&entry](const char* name) { return entry->at(name).get<std::string>(); };
+        if (entry)
+            entries_[part("output")] = {part("state") == "done", part("task"), part("result")};
+        else if (!line.empty()) // see Note
             ++damaged_;
     }
 }
@@ -61,7 +46,7 @@ void BatchJournal::Read(const std::string& text) {
 BatchJournal::State BatchJournal::StateOf(const std::string& output, const SourceMark& source,
                                           const std::string& settings) const {
     const std::lock_guard lock(mutex_);
-    const auto found = entries_.find(NameOf(output));
+    const auto found = entries_.find(text::NameOf(output));
     if (found == entries_.end() || found->second.task != TaskOf(source, settings))
         return State::kUnknown;
     if (!found->second.done)
@@ -81,17 +66,14 @@ void BatchJournal::NoteDone(const std::string& output, const SourceMark& source,
 }
 
 void BatchJournal::Note(const std::string& output, const Entry& entry) {
-    const std::string name = NameOf(output);
-    const std::string state = entry.done ? "done" : "begun";
-    const Json line{{"state", state},
-                    {"output", name},
-                    {"task", entry.task},
-                    {"result", entry.result},
-                    {"check", CheckOf(state, name, entry.task, entry.result)}};
+    const std::string name = text::NameOf(output);
+    const std::string line = CheckedLine({{"state", entry.done ? "done" : "begun"},
+                                          {"output", name},
+                                          {"task", entry.task},
+                                          {"result", entry.result}});
     const std::lock_guard lock(mutex_);
-    // A line that was cut by a crash ends here.
-    AppendWhole(path_, (entries_.empty() && damaged_ == 0 ? "" : "\n") +
-                           line.dump(-1, ' ', false, Json::error_handler_t::replace) + "\n");
+    // A line that was cut by a crash ends here; behind a whole one it is empty.
+    AppendWhole(path_, (entries_.empty() && damaged_ == 0 ? "" : "\n") + line);
     entries_[name] = entry;
 }
 

@@ -1,7 +1,7 @@
 #include "host/pieces/ClipJournal.h"
 
 #include "host/convert/Failure.h"
-#include "host/pieces/Digest.h"
+#include "host/pieces/CheckedLine.h"
 #include "host/pieces/WholeFile.h"
 #include "text/Path.h"
 
@@ -9,31 +9,13 @@
 #include <fmt/format.h>
 #include <sstream>
 #include <unistd.h>
+#include <vector>
 
 namespace movieconv {
 namespace {
 
 constexpr int kClipListVersion = 1;
 constexpr int64_t kLargestClipList = 256 << 20;
-
-std::string TextOf(const Json& json) {
-    return json.dump(-1, ' ', false, Json::error_handler_t::replace);
-}
-
-/// The object on a line, with a check of what it says.
-std::string CheckedLine(Json json) {
-    json["check"] = DigestOf(TextOf(json));
-    return TextOf(json) + "\n";
-}
-
-/// Nothing when the line was cut or edited.
-std::optional<Json> EntryOn(const std::string& line) {
-    Json json = Json::parse(line, nullptr, false);
-    if (!json.is_object())
-        return std::nullopt;
-    json.erase("check");
-    return CheckedLine(json) == line + "\n" ? std::optional(json) : std::nullopt;
-}
 
 /// By which a finished clip is known again, wherever its folder is now.
 Json MarkOfClip(const std::string& path) {
@@ -56,8 +38,11 @@ bool ClipJournal::IsPossible() const {
 }
 
 std::string ClipJournal::Header() const {
-    Json settings = WishesAsJson(request_);
-    settings["split"] = *request_.split;
+    Request request = request_;
+    const std::vector<SourceMark> texts = MarkTexts(request);
+    Json settings = WishesAsJson(request);
+    settings["split"] = *request.split;
+    settings["texts"] = MarksAsJson(texts);
     return CheckedLine({{"version", kClipListVersion},
                         {"madeWith", CurrentVersions()},
                         {"source", MarkAsJson(MarkOf(request_.input))},
@@ -70,7 +55,7 @@ std::optional<ClipStart> ClipJournal::Leftover() {
     std::istringstream lines(ReadWhole(path_, kLargestClipList));
     std::string line;
     std::getline(lines, line);
-    const std::optional<Json> header = EntryOn(line);
+    const std::optional<Json> header = ObjectOn(line);
     if (!header || header->value("version", 0) != kClipListVersion)
         throw Failure(Category::kRequest, fmt::format("\"{}\" is damaged, or no list of clips", path_),
                       Reason::kCannotResume);
@@ -82,7 +67,7 @@ std::optional<ClipStart> ClipJournal::Leftover() {
     kept_ = line + "\n";
     std::optional<ClipStart> next;
     while (std::getline(lines, line)) {
-        const std::optional<Json> entry = EntryOn(line);
+        const std::optional<Json> entry = ObjectOn(line);
         if (!entry || !IsFinished(*entry))
             break;
         kept_ += line + "\n";

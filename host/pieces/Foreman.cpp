@@ -44,6 +44,16 @@ Request RequestOf(const PieceOrder& order, const Plan& plan, int number, const s
     return request;
 }
 
+/// Throws Failure when a file is something else, which must not be lost.
+void RequirePlan(const std::string& path) {
+    try {
+        ReadPlan(path);
+    } catch (const Failure& failure) {
+        throw Failure(Category::kOutput, "the plan would replace another file: " + failure.Text(),
+                      Reason::kExists);
+    }
+}
+
 /// One piece being made, from its conversion to its name.
 class PieceErrand final : public Errand {
 public:
@@ -138,11 +148,10 @@ std::optional<Plan> Foreman::Prepare() {
         return plan;
     }
     CheckOutput(*order_.request);
-    if (std::optional<Plan> before = Leftover(BeginPlan(*order_.request, order_.division)))
+    Plan begun = BeginPlan(*order_.request, order_.division);
+    if (std::optional<Plan> before = Leftover(begun))
         return before;
-    std::optional<Plan> plan = MakePlan(
-        *order_.request, order_.division, [](void* self) { return static_cast<Foreman*>(self)->Stopped(); },
-        this);
+    std::optional<Plan> plan = MakePlan(std::move(begun), [this] { return Stopped(); });
     if (plan)
         WritePlan(order_.planPath, *plan);
     return plan;
@@ -160,6 +169,8 @@ std::optional<Plan> Foreman::Leftover(const Plan& now) {
                           Reason::kCannotResume);
         return before;
     }
+    if (planned && !order_.replace)
+        RequirePlan(order_.planPath);
     if (!order_.resume && (planned || pieces > 0)) {
         News().Warned({Warning::Kind::kLeftover,
                        fmt::format("\"{}\" with {} pieces is left of an earlier run; it is made anew",
@@ -273,7 +284,8 @@ void Foreman::ReportFinishing(double share) {
 }
 
 void Foreman::JoinAll() {
-    if (order_.resume) // what a killed joining left
+    CheckAgainst(plan_); // pieces of what was changed meanwhile do not belong together
+    if (order_.resume)   // what a killed joining left
         unlink((plan_.output + text::PartialSuffix(1)).c_str());
     ReportFinishing(0);
     double told = 0;

@@ -1,6 +1,7 @@
 #include "host/pieces/PieceFile.h"
 
 #include "host/convert/Failure.h"
+#include "host/pieces/Descriptor.h"
 #include "host/pieces/Digest.h"
 #include "host/pieces/WholeFile.h"
 #include "text/Path.h"
@@ -31,23 +32,17 @@ std::size_t SealSize(const Plan& plan) {
     return Claim(plan, 0, 0).size() + kDigits + 1;
 }
 
-struct OpenFile {
-    explicit OpenFile(const std::string& path, int mode) : number(open(path.c_str(), mode | O_CLOEXEC)) {}
-    ~OpenFile() {
-        if (number >= 0)
-            close(number);
-    }
-    OpenFile(const OpenFile&) = delete;
-    OpenFile& operator=(const OpenFile&) = delete;
+Descriptor OpenForReading(const std::string& path) {
+    return Descriptor(open(path.c_str(), O_RDONLY | O_CLOEXEC));
+}
 
-    /// Bytes; negative when it cannot be told.
-    int64_t Size() const {
-        struct stat status {};
-        return number >= 0 && fstat(number, &status) == 0 && S_ISREG(status.st_mode) ? status.st_size : -1;
-    }
-
-    const int number;
-};
+/// Bytes of an open file; negative when it cannot be told.
+int64_t SizeOf(const Descriptor& file) {
+    struct stat status {};
+    return file.Number() >= 0 && fstat(file.Number(), &status) == 0 && S_ISREG(status.st_mode)
+               ? status.st_size
+               : -1;
+}
 
 /// The files that belong to a plan of that name.
 std::vector<std::filesystem::path> FilesOf(const std::string& planPath) {
@@ -86,11 +81,11 @@ int64_t SealPiece(const std::string& file, const Plan& plan, const std::string& 
         std::string seal;
         int64_t bytes = 0;
         {
-            const OpenFile made(file, O_RDONLY);
-            bytes = made.Size();
+            const Descriptor made = OpenForReading(file);
+            bytes = SizeOf(made);
             seal = Claim(plan, number, bytes);
             Digest digest;
-            if (bytes < 0 || !AddFile(digest, made.number, 0, bytes))
+            if (bytes < 0 || !AddFile(digest, made.Number(), 0, bytes))
                 throw Failure(Category::kOutput,
                               fmt::format("\"{}\" cannot be read again: {}", file, std::strerror(errno)));
             digest.Add(seal);
@@ -112,13 +107,13 @@ std::string FaultOf(const Plan& plan, const std::string& planPath, int number) {
     const auto fault = [&](const char* what) {
         return fmt::format("piece {} (\"{}\") {}", number, path, what);
     };
-    const OpenFile file(path, O_RDONLY);
-    if (file.number < 0)
+    const Descriptor file = OpenForReading(path);
+    if (file.Number() < 0)
         return fault(errno == ENOENT ? "is missing" : "cannot be opened");
     const auto sealSize = static_cast<int64_t>(SealSize(plan));
-    const int64_t bytes = file.Size() - sealSize;
+    const int64_t bytes = SizeOf(file) - sealSize;
     std::string seal(static_cast<std::size_t>(sealSize), ' ');
-    if (bytes < 0 || pread(file.number, seal.data(), seal.size(), static_cast<off_t>(bytes)) != sealSize ||
+    if (bytes < 0 || pread(file.Number(), seal.data(), seal.size(), static_cast<off_t>(bytes)) != sealSize ||
         seal.compare(0, 8, "MCSEAL1\n") != 0)
         return fault("is cut off, or no piece");
     const std::string claim = Claim(plan, number, bytes);
@@ -127,7 +122,7 @@ std::string FaultOf(const Plan& plan, const std::string& planPath, int number) {
         return fault(other != plan.hash ? "belongs to another plan" : "is another piece under its name");
     }
     Digest digest;
-    if (!AddFile(digest, file.number, 0, bytes))
+    if (!AddFile(digest, file.Number(), 0, bytes))
         return fault("cannot be read");
     digest.Add(claim);
     if (digest.Hex() + "\n" != seal.substr(claim.size()))

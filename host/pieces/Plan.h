@@ -6,6 +6,7 @@
 #include "host/convert/Request.h"
 
 #include <cstdint>
+#include <functional>
 #include <map>
 #include <optional>
 #include <string>
@@ -45,8 +46,9 @@ struct Piece {
 struct Plan {
     std::map<std::string, std::string> versions; ///< Of the program and of the libraries that matter.
     SourceMark source;
-    std::string output; ///< Absolute.
-    Request settings;   ///< Without input, output and piece.
+    std::vector<SourceMark> texts; ///< Files of subtitles, which the settings name.
+    std::string output;            ///< Absolute.
+    Request settings;              ///< Without input, output and piece.
     Division division;
     bool fromStart = false; ///< See PieceCut.
     bool hasRates = false;  ///< The pictures have a bit rate, which begins anew in every piece.
@@ -65,20 +67,23 @@ std::map<std::string, std::string> CurrentVersions();
 /// Looks at a file. Throws Failure when it cannot be read, or not twice.
 SourceMark MarkOf(const std::string& path);
 
-/// Throws Failure that says what differs when the source, or this program, is not the one that was planned
-/// with.
+/// Looks at the files of subtitles that a request names, and lets it name them from anywhere. Throws Failure.
+std::vector<SourceMark> MarkTexts(Request& request);
+
+/// Throws Failure that says what differs when the source, a file of subtitles or this program is not the one
+/// that was planned with.
 void CheckAgainst(const Plan& plan);
 
 /// What differs, in words; empty when nothing does. `now` need not be divided yet.
 std::string Difference(const Plan& before, const Plan& now);
 
-/// Reads the source's stamps and divides it. `request` is a conversion of one file with pictures. `stopped`
-/// is asked now and then. Throws Failure when that is impossible; nothing when it was stopped.
-std::optional<Plan> MakePlan(const Request& request, const Division& division, bool (*stopped)(void*),
-                             void* context);
-
-/// The plan of a request as far as the source's stamps are not needed.
+/// The plan of a request, a conversion of one file with pictures, as far as the source's stamps are not
+/// needed. Throws Failure when that is impossible.
 Plan BeginPlan(const Request& request, const Division& division);
+
+/// Completes it: reads the source's stamps and divides it. `stopped` is asked now and then. Throws Failure
+/// when that is impossible; nothing when it was stopped.
+std::optional<Plan> MakePlan(Plan plan, const std::function<bool()>& stopped);
 
 /// What pieces cost where the pictures have a bit rate, a sentence; empty where they do not.
 std::string TellBitRate(const Plan& plan);

@@ -1,4 +1,5 @@
 #include "host/convert/Failure.h"
+#include "host/pieces/CheckedLine.h"
 #include "host/pieces/Digest.h"
 #include "host/pieces/Plan.h"
 #include "host/pieces/SettingsText.h"
@@ -43,6 +44,7 @@ Json AsJson(const Plan& plan) {
     json["version"] = kVersion;
     json["madeWith"] = plan.versions;
     json["source"] = MarkAsJson(plan.source);
+    json["texts"] = MarksAsJson(plan.texts);
     json["output"] = plan.output;
     json["settings"] = SettingsAsJson(plan.settings);
     json["division"] = AsJson(plan.division);
@@ -62,7 +64,7 @@ Json AsJson(const Plan& plan) {
 }
 
 std::string HashOf(const Json& json) {
-    return DigestOf(json.dump(-1, ' ', false, Json::error_handler_t::replace));
+    return DigestOf(AsText(json));
 }
 
 /// Names are bytes; JSON takes UTF-8 only.
@@ -90,18 +92,18 @@ std::string Path(const Json& json) {
     const auto text = json.get<std::string>();
     const std::filesystem::path path(text);
     if (!path.is_absolute() || path.lexically_normal() != path || text.find('\0') != std::string::npos)
-        RefusePlan(fmt::format("\"{}\" is not an absolute path", text));
+        RefusePlan(fmt::format("\"{}\" is not an absolute path without detours", text));
     return text;
 }
 
-SourceMark SourceFrom(const Json& json) {
-    SourceMark source;
-    source.path = Path(json.at("path"));
-    source.bytes = Natural(json, "bytes");
-    source.modified = json.at("modified").get<int64_t>();
-    source.head = json.at("headSha256").get<std::string>();
-    source.tail = json.at("tailSha256").get<std::string>();
-    return source;
+SourceMark MarkFrom(const Json& json) {
+    SourceMark mark;
+    mark.path = Path(json.at("path"));
+    mark.bytes = Natural(json, "bytes");
+    mark.modified = json.at("modified").get<int64_t>();
+    mark.head = json.at("headSha256").get<std::string>();
+    mark.tail = json.at("tailSha256").get<std::string>();
+    return mark;
 }
 
 Piece PieceFrom(const Json& json) {
@@ -141,7 +143,9 @@ Plan PlanFrom(const Json& json) {
     Plan plan;
     plan.pictures = PiecesFrom(json.at("pieces"));
     plan.versions = json.at("madeWith").get<std::map<std::string, std::string>>();
-    plan.source = SourceFrom(json.at("source"));
+    plan.source = MarkFrom(json.at("source"));
+    for (const Json& text : json.at("texts"))
+        plan.texts.push_back(MarkFrom(text));
     plan.output = Path(json.at("output"));
     plan.settings = SettingsFromJson(json.at("settings"));
     plan.fromStart = json.at("readFromStart").get<bool>();
@@ -174,7 +178,10 @@ Plan ReadPlan(const std::string& path) {
 }
 
 void WritePlan(const std::string& path, Plan& plan) {
-    for (const std::string& name : {plan.source.path, plan.output})
+    std::vector<std::string> names{plan.source.path, plan.output};
+    for (const SourceMark& text : plan.texts)
+        names.push_back(text.path);
+    for (const std::string& name : names)
         if (!IsUtf8(name))
             throw Failure(Category::kRequest,
                           fmt::format("\"{}\" cannot stand in a plan: its name is not UTF-8", name));
@@ -187,6 +194,8 @@ void WritePlan(const std::string& path, Plan& plan) {
 std::string Difference(const Plan& before, const Plan& now) {
     std::string what =
         DifferenceIn(AsJson(before), AsJson(now), {"madeWith", "source", "settings", "division"});
+    if (before.texts != now.texts)
+        what += fmt::format("{}a file of subtitles was changed", what.empty() ? "" : "; ");
     if (before.output != now.output)
         what += fmt::format("{}the output was \"{}\"", what.empty() ? "" : "; ", before.output);
     return what;

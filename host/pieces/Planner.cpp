@@ -54,16 +54,17 @@ std::string Obstacle(const Request& request, const Division& division) {
     return {};
 }
 
+/// To read the stamps of its pictures by.
 Request StampRequest(const Plan& plan) {
     Request request = plan.settings;
     request.input = plan.source.path;
     request.output = plan.output;
+    request.noAudio = true;
     request.piece.emplace().pictures = false;
     return request;
 }
 
-std::optional<Stamps> ReadStamps(Movie& movie, const Request& request, bool (*stopped)(void*),
-                                 void* context) {
+std::optional<Stamps> ReadStamps(Movie& movie, const Request& request, const std::function<bool()>& stopped) {
     constexpr std::size_t kAskEvery = 4096;
     VideoDecoder& pictures = *movie.Pictures();
     if (request.begin > 0)
@@ -76,7 +77,7 @@ std::optional<Stamps> ReadStamps(Movie& movie, const Request& request, bool (*st
         stamps.times.push_back(+picture->llTime); // a copy: the record is packed
         stamps.repaired.push_back(movie.StampIsRepaired());
         stamps.end = picture->llTime + picture->nDuration;
-        if (stamps.times.size() % kAskEvery == 0 && stopped != nullptr && stopped(context))
+        if (stamps.times.size() % kAskEvery == 0 && stopped())
             return std::nullopt;
     }
     if (request.length)
@@ -172,6 +173,25 @@ std::size_t PicturesAhead(const EncodeParam& param, const Request& request, cons
     return static_cast<std::size_t>(MWPicturesAhead(param.fccVideo, speed));
 }
 
+/// The pieces that begin with the pictures `firsts`.
+std::vector<Piece> PiecesOf(const Stamps& stamps, const std::vector<std::size_t>& firsts,
+                            const std::vector<std::optional<int64_t>>& ticks, std::size_t ahead) {
+    const auto timeOf = [&](std::size_t picture) {
+        return picture < stamps.times.size() ? stamps.times[picture]
+                                             : std::max(stamps.end, stamps.times.back() + 1);
+    };
+    std::vector<Piece> pieces;
+    for (std::size_t i = 0; i < firsts.size(); ++i) {
+        const std::size_t next = i + 1 < firsts.size() ? firsts[i + 1] : stamps.times.size();
+        pieces.push_back({.begin = stamps.times[firsts[i]],
+                          .end = timeOf(next),
+                          .until = timeOf(next + ahead),
+                          .pictures = static_cast<int64_t>(next - firsts[i]),
+                          .tick = ticks[firsts[i]]});
+    }
+    return pieces;
+}
+
 } // namespace
 
 std::map<std::string, std::string> CurrentVersions() {
@@ -200,50 +220,33 @@ Plan BeginPlan(const Request& request, const Division& division) {
     plan.settings.preview.reset();
     plan.settings.input.clear();
     plan.settings.output.clear();
+    plan.texts = MarkTexts(plan.settings);
     return plan;
 }
 
-std::optional<Plan> MakePlan(const Request& request, const Division& division, bool (*stopped)(void*),
-                             void* context) {
-    Plan plan = BeginPlan(request, division);
-    Request reading = StampRequest(plan);
-    Request pictures = reading;
-    pictures.noAudio = true;
-    Movie movie = OpenMovie(pictures);
+std::optional<Plan> MakePlan(Plan plan, const std::function<bool()>& stopped) {
+    const Request request = StampRequest(plan);
+    Movie movie = OpenMovie(request);
     if (!movie.Info().pictures)
         throw Failure(Category::kSource,
-                      fmt::format("\"{}\" holds no pictures that could be divided", request.input));
-    LengthToConvert(pictures, movie.Info()); // refuses a begin behind the end
-    const std::optional<Stamps> stamps = ReadStamps(movie, pictures, stopped, context);
+                      fmt::format("\"{}\" holds no pictures that could be divided", plan.source.path));
+    LengthToConvert(request, movie.Info()); // refuses a begin behind the end
+    const std::optional<Stamps> stamps = ReadStamps(movie, request, stopped);
     if (!stamps)
         return std::nullopt;
     if (MarkOf(plan.source.path) != plan.source)
         throw Failure(Category::kSource,
                       fmt::format("\"{}\" was written to while it was read", plan.source.path));
     plan.fromStart = stamps->clockJumps;
-    plan.hasRates = HasRates(pictures, ChooseFormat(pictures), movie.Info());
+    plan.hasRates = HasRates(request, ChooseFormat(request), movie.Info());
     plan.memory = MemoryPerPiece(*movie.Info().pictures);
-    const std::vector<std::size_t> firsts = FirstPictures(*stamps, division);
+    const std::vector<std::size_t> firsts = FirstPictures(*stamps, plan.division);
     if (firsts.size() > std::size_t{kMostPieces})
         throw Failure(Category::kRequest, fmt::format("that makes {} pieces; at most {} can be made",
                                                       firsts.size(), kMostPieces));
-    const EncodeParam param = ParamFor(pictures, movie);
-    const auto ticks = TicksBefore(param, movie, *stamps);
-    const std::size_t ahead = PicturesAhead(param, pictures, movie.Info());
-    for (std::size_t i = 0; i < firsts.size(); ++i) {
-        const std::size_t next = i + 1 < firsts.size() ? firsts[i + 1] : stamps->times.size();
-        Piece piece;
-        piece.begin = stamps->times[firsts[i]];
-        const auto timeOf = [&](std::size_t picture) {
-            return picture < stamps->times.size() ? stamps->times[picture]
-                                                  : std::max(stamps->end, stamps->times.back() + 1);
-        };
-        piece.end = timeOf(next);
-        piece.until = timeOf(next + ahead);
-        piece.pictures = static_cast<int64_t>(next - firsts[i]);
-        piece.tick = ticks[firsts[i]];
-        plan.pictures.push_back(piece);
-    }
+    const EncodeParam param = ParamFor(request, movie);
+    plan.pictures = PiecesOf(*stamps, firsts, TicksBefore(param, movie, *stamps),
+                             PicturesAhead(param, request, movie.Info()));
     return plan;
 }
 

@@ -260,6 +260,13 @@ Json MarkAsJson(const SourceMark& source) {
             {"tailSha256", source.tail}};
 }
 
+Json MarksAsJson(const std::vector<SourceMark>& marks) {
+    Json list = Json::array();
+    for (const SourceMark& mark : marks)
+        list.push_back(MarkAsJson(mark));
+    return list;
+}
+
 std::string DifferenceIn(const Json& before, const Json& now, const std::vector<std::string>& parts) {
     const auto text = [](const Json& json, const std::string& key) {
         return json.contains(key) ? json.at(key).dump() : std::string("nothing");

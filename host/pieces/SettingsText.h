@@ -20,6 +20,7 @@ Json SettingsAsJson(const Request& request);
 Json WishesAsJson(const Request& request);
 
 Json MarkAsJson(const SourceMark& source);
+Json MarksAsJson(const std::vector<SourceMark>& marks);
 
 /// What differs between two objects in these parts of them, which are objects themselves, in words; empty
 /// when nothing does.

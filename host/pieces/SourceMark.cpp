@@ -3,6 +3,7 @@
 #include "host/convert/Failure.h"
 #include "host/pieces/Descriptor.h"
 #include "host/pieces/Digest.h"
+#include "host/source/BurnWish.h"
 
 #include <algorithm>
 #include <cerrno>
@@ -30,6 +31,20 @@ std::string EdgeOf(const std::string& path, int descriptor, int64_t offset, int6
     return digest.Hex();
 }
 
+void CheckUnchanged(const SourceMark& planned, const char* kind) {
+    const SourceMark now = MarkOf(planned.path);
+    std::string what;
+    if (now.bytes != planned.bytes)
+        what = fmt::format("it has {} bytes, not {}", now.bytes, planned.bytes);
+    else if (now.head != planned.head || now.tail != planned.tail)
+        what = "it holds something else";
+    else if (now.modified != planned.modified)
+        what = "it was written to since";
+    if (!what.empty())
+        throw Failure(Category::kSource,
+                      fmt::format("\"{}\" is not {} that was planned with: {}", planned.path, kind, what));
+}
+
 } // namespace
 
 SourceMark MarkOf(const std::string& path) {
@@ -52,18 +67,28 @@ SourceMark MarkOf(const std::string& path) {
     return mark;
 }
 
+std::vector<SourceMark> MarkTexts(Request& request) {
+    std::vector<std::string*> names;
+    for (SubtitleFileWish& wish : request.subtitleFiles)
+        names.push_back(&wish.path);
+    if (!request.burnSubtitles.empty() && !NamesStream({request.burnSubtitles, {}}))
+        names.push_back(&request.burnSubtitles);
+    std::vector<SourceMark> marks;
+    for (std::string* name : names) {
+        try {
+            marks.push_back(MarkOf(*name));
+        } catch (const Failure& failure) {
+            throw Failure(Category::kRequest, failure.Text());
+        }
+        *name = marks.back().path;
+    }
+    return marks;
+}
+
 void CheckAgainst(const Plan& plan) {
-    const SourceMark now = MarkOf(plan.source.path);
-    std::string what;
-    if (now.bytes != plan.source.bytes)
-        what = fmt::format("it has {} bytes, not {}", now.bytes, plan.source.bytes);
-    else if (now.head != plan.source.head || now.tail != plan.source.tail)
-        what = "it holds something else";
-    else if (now.modified != plan.source.modified)
-        what = "it was written to since";
-    if (!what.empty())
-        throw Failure(Category::kSource,
-                      fmt::format("\"{}\" is not the source that was planned: {}", plan.source.path, what));
+    CheckUnchanged(plan.source, "the source");
+    for (const SourceMark& text : plan.texts)
+        CheckUnchanged(text, "the file of subtitles");
     for (const auto& [name, version] : CurrentVersions()) {
         const auto planned = plan.versions.find(name);
         if (planned == plan.versions.end() || planned->second != version)

@@ -67,7 +67,7 @@ std::string CompanionFiles::Permit(const std::string& url) const {
 }
 
 std::unique_ptr<InputFile> CompanionFiles::Open(const std::string& path) const {
-    return std::make_unique<InputFile>(path, interruption_);
+    return std::make_unique<InputFile>(path, Growth::kRead, interruption_);
 }
 
 int CompanionFiles::OnOpen(AVFormatContext* context, AVIOContext** io, const char* url, int flags,

@@ -29,7 +29,7 @@ void Add(CueList& list, av::Packet packet, int64_t begin, int64_t duration) {
 
 void ReadStream(CueList& list, const Source& source, const BurnWish& wish, bool playlists) {
     const int stream = WantedTracks(source.Info().streams, StreamKind::kSubtitles, {{wish.what}}).front();
-    MovieReader reader(source.Info().path, playlists, source.Reader().Interruptible());
+    MovieReader reader(source.Info().path, playlists, Growth::kRead, source.Reader().Interruptible());
     if (!reader.IsSeekable())
         throw TrackError("the subtitles of a pipe cannot be drawn into its pictures");
     AVFormatContext* context = reader.Context();

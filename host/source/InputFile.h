@@ -12,12 +12,15 @@
 
 namespace movieconv {
 
+/// What becomes of what is written to a regular file after it was opened.
+enum class Growth { kRead, kLeftOut };
+
 /// One thread reads through Io().
 class InputFile {
 public:
     /// Opens `path`, bytes as the system has them: it is never taken for a protocol. A pipe that nobody
     /// writes into yet is waited for by the first read. Throws std::system_error with the reason.
-    InputFile(const std::string& path, std::shared_ptr<const Interruption> interruption);
+    InputFile(const std::string& path, Growth growth, std::shared_ptr<const Interruption> interruption);
     InputFile(const InputFile&) = delete;
     InputFile& operator=(const InputFile&) = delete;
 
@@ -47,12 +50,14 @@ private:
         const int number_;
     };
 
-    int Read(uint8_t* data, int size) const;
-    int64_t Seek(int64_t offset, int whence) const;
+    int Read(uint8_t* data, int size);
+    int64_t Seek(int64_t offset, int whence);
 
     const Descriptor file_;
     const std::shared_ptr<const Interruption> interruption_;
     int64_t size_ = 0;
+    int64_t end_ = INT64_MAX; // where reading ends at the latest
+    int64_t place_ = 0;       // of the next byte
     av::Io io_;
 };
 

@@ -121,7 +121,7 @@ std::map<int, std::vector<av::Packet>>& Movie::EarlierCues() {
         if (stream.kind == StreamKind::kSubtitles)
             subtitles.push_back(stream.index);
     const int main = Info().pictures ? Info().pictures->index : Info().sound->index;
-    MovieReader again(Info().path, choice_.playlists, source_.Reader().Interruptible());
+    MovieReader again(Info().path, choice_.playlists, Growth::kRead, source_.Reader().Interruptible());
     earlierCues_ = ReadEarlierCues(again, main, std::move(subtitles), bounds_.begin);
     return earlierCues_;
 }

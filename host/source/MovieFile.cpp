@@ -40,9 +40,9 @@ std::string ReasonOf(int error) {
 
 } // namespace
 
-MovieFile::MovieFile(const std::string& path, bool playlists,
+MovieFile::MovieFile(const std::string& path, bool playlists, Growth growth,
                      const std::shared_ptr<const Interruption>& interruption) try
-    : path_(path), companions_(path, playlists, interruption), bytes_(path, interruption) {
+    : path_(path), companions_(path, playlists, interruption), bytes_(path, growth, interruption) {
     // The prefix keeps a colon in the name from being read as a protocol.
     const std::string url = "file:" + path;
     Open(url, Recognise(url, playlists));

@@ -22,7 +22,7 @@ public:
     /// file: what names other files is opened only if `playlists`, and then may name only movies in its own
     /// folder and below. `interruption` ends this, too. Throws SourceError, PlaylistError for a playlist
     /// that was not allowed.
-    MovieFile(const std::string& path, bool playlists,
+    MovieFile(const std::string& path, bool playlists, Growth growth,
               const std::shared_ptr<const Interruption>& interruption);
     MovieFile(const MovieFile&) = delete;
     MovieFile& operator=(const MovieFile&) = delete;

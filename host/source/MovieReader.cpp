@@ -8,11 +8,13 @@
 
 namespace movieconv {
 
-MovieReader::MovieReader(const std::string& path, bool playlists, std::shared_ptr<Interruption> interruption)
+MovieReader::MovieReader(const std::string& path, bool playlists, Growth growth,
+                         std::shared_ptr<Interruption> interruption)
     : path_(path),
       playlists_(playlists),
+      growth_(growth),
       interruption_(std::move(interruption)),
-      file_(std::make_unique<MovieFile>(path, playlists, interruption_)) {
+      file_(std::make_unique<MovieFile>(path, playlists, growth, interruption_)) {
     if (const int64_t start = Context()->start_time; start != AV_NOPTS_VALUE)
         start_ = av_rescale_q(start, {1, AV_TIME_BASE}, {1, kTicksPerSecond});
 }
@@ -84,7 +86,7 @@ bool MovieReader::Rewind() {
 }
 
 void MovieReader::Reopen() {
-    auto again = std::make_unique<MovieFile>(path_, playlists_, interruption_);
+    auto again = std::make_unique<MovieFile>(path_, playlists_, growth_, interruption_);
     int last = -1;
     for (const std::vector<int>* streams : {&selected_, &beside_})
         for (const int stream : *streams)

@@ -17,7 +17,8 @@ namespace movieconv {
 class MovieReader {
 public:
     /// Opens as MovieFile does. Throws SourceError.
-    MovieReader(const std::string& path, bool playlists, std::shared_ptr<Interruption> interruption);
+    MovieReader(const std::string& path, bool playlists, Growth growth,
+                std::shared_ptr<Interruption> interruption);
 
     /// Streams are the context's only until Rewind or Reopen, their numbers stay.
     AVFormatContext* Context() const { return file_->Context(); }
@@ -55,6 +56,7 @@ private:
 
     const std::string path_;
     const bool playlists_;
+    const Growth growth_;
     const std::shared_ptr<Interruption> interruption_;
     std::unique_ptr<MovieFile> file_;
     int64_t start_ = 0;

@@ -51,7 +51,8 @@ void TakeNotes(const ContainerNotes& notes, SourceInfo& info) {
 
 Source::Source(const std::string& path, const SourceChoice& choice,
                std::shared_ptr<Interruption> interruption)
-    : reader_(path, choice.playlists, std::move(interruption)) {
+    : reader_(path, choice.playlists, choice.untilNow ? Growth::kLeftOut : Growth::kRead,
+              std::move(interruption)) {
     AVFormatContext& context = *reader_.Context();
     info_.path = path;
     info_.bytes = reader_.File().Bytes();

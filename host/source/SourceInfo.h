@@ -159,6 +159,7 @@ struct SourceChoice {
     bool stampsOnly = false; ///< Do not decode the pictures.
     bool fromStart = false;  ///< Read from the start of the source, whatever the begin.
     bool playlists = false;  ///< Also open what names other movies, in its own folder and below.
+    bool untilNow = false;   ///< Leave out what is written to the file after it was opened.
 };
 
 } // namespace movieconv

@@ -70,12 +70,33 @@ ExitCode Estimate(const Options& options, const StandardStreams& streams) {
     return room.needed <= room.free ? ExitCode::kDone : ExitCode::kNoSpace;
 }
 
+/// The plan of that name, of the same conversion; nothing when there is none. Throws Failure when it is of
+/// another one.
+std::optional<Plan> PlanThere(const std::string& path, const Plan& begun) {
+    if (access(path.c_str(), F_OK) != 0)
+        return std::nullopt;
+    const auto refuse = [&](const std::string& why) {
+        return Failure(Category::kOutput, fmt::format("\"{}\" exists{}", path, why), Reason::kExists);
+    };
+    std::optional<Plan> there;
+    try {
+        there = ReadPlan(path);
+    } catch (const Failure&) {
+        throw refuse(", and is no whole plan");
+    }
+    if (const std::string difference = Difference(*there, begun); !difference.empty())
+        throw refuse(" and is of another conversion: " + difference);
+    return there;
+}
+
 ExitCode WriteNewPlan(const Options& options, const StandardStreams& streams) {
     const std::string& path = *options.plan;
-    if (!options.request.overwrite && access(path.c_str(), F_OK) == 0)
-        throw Failure(Category::kOutput, fmt::format("\"{}\" exists", path), Reason::kExists);
-    std::optional<Plan> plan = MakePlan(options.request, options.division, nullptr, nullptr);
-    WritePlan(path, *plan);
+    Plan begun = BeginPlan(options.request, options.division);
+    std::optional<Plan> plan = options.request.overwrite ? std::nullopt : PlanThere(path, begun);
+    if (!plan) {
+        plan = MakePlan(std::move(begun), [] { return false; });
+        WritePlan(path, *plan);
+    }
     if (options.quiet)
         return ExitCode::kDone;
     for (const std::string& complaint : options.complaints)

@@ -54,6 +54,7 @@ TEST(ManyMovies, AreConvertedOnceAndAgainOnlyWhereSomethingChanged) {
     ASSERT_EQ(second.code, 0) << second.err;
     EXPECT_EQ(movies.Written("a.mp4"), before);
     EXPECT_TRUE(Has(second.err, "a.mp4\" is there already")) << second.err;
+    EXPECT_FALSE(Has(second.err, "damaged")) << second.err;
 
     EXPECT_EQ(movies.Convert({"--size", "80x60"}).code, 4) << "other settings would replace what is there";
     EXPECT_EQ(movies.Convert({"--size", "80x60", "-y"}).code, 0);

@@ -11,6 +11,7 @@
 #include <csignal>
 #include <cstdlib>
 #include <fmt/format.h>
+#include <fstream>
 #include <random>
 #include <string>
 #include <sys/stat.h>
@@ -67,7 +68,7 @@ TEST(Pieces, GiveTheSameBytesInAnyOrderAndInOneProcess) {
 
     const std::string whole = farm.folder / "whole.mp4";
     ASSERT_EQ(Call({"-q", Source(), whole}).code, 0);
-    EXPECT_EQ(packets::Of(whole), packets::Of(farm.output));
+    EXPECT_EQ(packets::Difference(farm.output, whole), "");
     for (const char* jobs : {"1", "2", "5"}) {
         ASSERT_EQ(Call({"-q", "-y", "--jobs", jobs, "--pieces", "4", Source(), whole}).code, 0);
         EXPECT_EQ(ReadFile(whole), bytes) << jobs << " pieces at once";
@@ -101,6 +102,48 @@ TEST(Pieces, ThatDoNotBelongTogetherAreRefusedByTheirNames) {
     refuses(1, "belongs to another plan");
     ASSERT_EQ(farm.Make(1).code, 0) << "a piece that is none is made again";
     EXPECT_EQ(farm.Join().code, 0);
+}
+
+TEST(Pieces, ArePlannedAgainOnlyForTheSameConversion) {
+    const Planned farm;
+    const std::string plan = ReadFile(farm.plan);
+    const auto again = [&](const Args& options) {
+        return Call(test_movies::Join(Args{"--plan", farm.plan, "--pieces", "4"}, options,
+                                      Args{Source(), farm.output}));
+    };
+    EXPECT_EQ(again({}).code, 0);
+    const Result other = again({"--size", "80x60"});
+    EXPECT_EQ(other.code, kCannotWrite);
+    EXPECT_TRUE(Has(other.err, "settings size was nothing, now [80,60]")) << other.err;
+    EXPECT_EQ(ReadFile(farm.plan), plan);
+    EXPECT_EQ(again({"--size", "80x60", "-y"}).code, 0);
+    EXPECT_NE(ReadFile(farm.plan), plan);
+    WriteFile(farm.plan, "precious");
+    EXPECT_EQ(again({}).code, kCannotWrite);
+    EXPECT_EQ(ReadFile(farm.plan), "precious");
+}
+
+/// Files of subtitles belong to the plan: named from anywhere, and noticed when they change.
+TEST(Pieces, HaveTheSubtitlesThatWerePlanned) {
+    const Planned farm;
+    const std::string texts = farm.folder / "texts.srt";
+    const std::string cue = "1\n00:00:01,000 --> 00:00:03,000\nA cue\n";
+    WriteFile(texts, cue);
+    const std::string relative = std::filesystem::relative(texts).string();
+    const auto plan = [&](const char* option, const std::string& name) {
+        return Call({"-q", "-y", "--plan", farm.plan, "--pieces", "4", option, name, Source(), farm.output});
+    };
+    for (const char* option : {"--subtitle-file", "--burn-subtitles"}) {
+        ASSERT_EQ(plan(option, relative).code, 0);
+        EXPECT_TRUE(Has(ReadFile(farm.plan), "\"" + texts + "\"")) << "named from anywhere";
+        const Result made = farm.Make(4);
+        EXPECT_EQ(made.code, 0) << made.err;
+        WriteFile(texts, cue + "\n");
+        const Result changed = farm.Make(0);
+        EXPECT_EQ(changed.code, kCannotRead);
+        EXPECT_TRUE(Has(changed.err, "is not the file of subtitles that was planned with")) << changed.err;
+        EXPECT_EQ(plan(option, farm.folder / "nowhere.srt").code, kUsage);
+    }
 }
 
 TEST(Pieces, ArePlannedOfNothingThatCannotBeReadTwice) {
@@ -175,6 +218,11 @@ TEST(Pieces, NeverReplaceAnOutputWithoutLeave) {
     EXPECT_EQ(ReadFile(farm.output), "precious");
     EXPECT_EQ(Call({"-q", "-y", "--join", farm.plan}).code, 0);
     EXPECT_NE(ReadFile(farm.output), "precious");
+
+    const std::string other = farm.folder / "other.mp4";
+    WriteFile(other + ".plan", "precious");
+    EXPECT_EQ(Call({"-q", "--jobs", "1", Source(), other}).code, kCannotWrite);
+    EXPECT_EQ(ReadFile(other + ".plan"), "precious");
 }
 
 /// A source whose pieces take long enough to be met at work.
@@ -194,6 +242,21 @@ TEST(Pieces, EndOnASignalWithCodeSixAndLeaveNothing) {
     const Result result = piece.Finish();
     EXPECT_EQ(result.code, kStopped) << result.out << result.err;
     EXPECT_EQ(folder.Names(), (std::vector<std::string>{"movie.plan"}));
+}
+
+TEST(Pieces, OfASourceThatIsWrittenToMeanwhileAreNotJoined) {
+    const Folder folder;
+    const std::string source = folder / "source.mkv";
+    WriteFile(source, ReadFile(LongSource()));
+    Running run({"--progress", "json", "--jobs", "1", "--pieces", "8", source, folder / "out.mp4"}, false);
+    ASSERT_TRUE(run.WaitFor(R"("event":"progress")"));
+    run.Signal(SIGSTOP);
+    std::ofstream(source, std::ios::binary | std::ios::app) << "more";
+    run.Signal(SIGCONT);
+    const Result result = run.Finish();
+    EXPECT_EQ(result.code, kCannotRead) << result.err;
+    EXPECT_TRUE(Has(result.out + result.err, "is not the source that was planned with")) << result.out;
+    EXPECT_FALSE(std::filesystem::exists(folder / "out.mp4"));
 }
 
 /// Two machines that make the same piece at once.
