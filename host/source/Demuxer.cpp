@@ -68,8 +68,10 @@ bool Demuxer::SeekBefore(double seconds) {
         if (!seek())
             return false;
         moved_ = true;
-        if (KeyPictureAtOrBefore(ToMediaTime(seconds)))
+        if (KeyPictureAtOrBefore(ToMediaTime(seconds))) {
+            awaitsKey_ = source_.PictureStream() != nullptr;
             return seek();
+        }
         back = 2 * back + 1;
     }
     return false;
@@ -283,6 +285,13 @@ bool Demuxer::ReadOne() {
     const auto beside = queues_.find({packet->stream_index, true});
     if (taken == queues_.end() && beside == queues_.end())
         return true;
+    if (awaitsKey_ && packet->stream_index == source_.Info().pictures->index) {
+        // Some containers land between key pictures, whatever is asked for. Decoders take the stamps of
+        // pictures that build on missing ones for faulty, and those of all that follow, too.
+        awaitsKey_ = (packet->flags & AV_PKT_FLAG_KEY) == 0;
+        if (awaitsKey_)
+            return true;
+    }
     RepairClock(*packet);
     av::Packet copy(taken != queues_.end() && beside != queues_.end() ? av_packet_clone(packet.get())
                                                                       : nullptr);

@@ -115,7 +115,8 @@ private:
     double soughtSeconds_ = -1;
     bool soughtWell_ = false;
     bool staysAtStart_ = false;
-    bool moved_ = false; // away from the start
+    bool moved_ = false;     // away from the start
+    bool awaitsKey_ = false; // picture, to which it was sought
 
     mutable std::mutex mutex_;
     std::condition_variable changed_;
