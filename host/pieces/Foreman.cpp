@@ -54,61 +54,63 @@ void RequirePlan(const std::string& path) {
     }
 }
 
+} // namespace
+
 /// One piece being made, from its conversion to its name.
-class PieceErrand final : public Errand {
+class Foreman::PieceErrand final : public Errand {
 public:
     /// `length`: seconds of pictures that the piece brings.
-    PieceErrand(Outlet& news, const Plan& plan, const std::string& planPath, int number, std::string file,
-                double length)
-        : news_(news),
-          plan_(plan),
-          planPath_(planPath),
+    PieceErrand(Foreman& foreman, int number, std::string file, double length, bool fromStart)
+        : foreman_(foreman),
           number_(number),
           file_(std::move(file)),
-          length_(length) {}
+          length_(length),
+          fromStart_(fromStart) {}
 
     double Share(const Progress& latest) const override { return std::min(latest.position, length_); }
     void Closed(const ClosedFile& news) override { pictures_ = news.pictures; }
-    void LeftBehind(const NotCarried& news) override { news_.LeftBehind(news); }
+    void LeftBehind(const NotCarried& news) override { foreman_.News().LeftBehind(news); }
     void Conclude(Verdict& verdict) override {
-        if (verdict.outcome != Outcome::kDone) {
+        const bool lacks = Lacks(verdict);
+        if (verdict.outcome != Outcome::kDone || lacks)
             unlink(file_.c_str()); // whatever was made is not the piece
-            return;
-        }
-        try {
-            CheckCount(verdict);
-            verdict.bytes = SealPiece(file_, plan_, planPath_, number_);
+        if (lacks && fromStart_ && verdict.outcome == Outcome::kDone)
+            throw Failure(
+                Category::kSource,
+                fmt::format("piece {} has {} pictures, {} were planned: \"{}\" holds others than its "
+                            "stamps tell, and can only be converted undivided",
+                            number_, pictures_, Planned(), foreman_.plan_.source.path));
+        if (lacks && !fromStart_) {
+            const std::lock_guard lock(foreman_.mutex_);
+            foreman_.lacking_.insert(number_);
+            verdict = Verdict{};
+            verdict.outcome = Outcome::kDone; // and no file: it is made again
+        } else if (verdict.outcome == Outcome::kDone) {
+            verdict.bytes = SealPiece(file_, foreman_.plan_, foreman_.order_.planPath, number_);
             verdict.position = length_;
-        } catch (...) {
-            unlink(file_.c_str());
-            throw;
         }
     }
 
 private:
-    /// Throws Failure when not every planned picture was taken, unless the source is damaged there.
-    void CheckCount(const Verdict& verdict) const {
-        if (plan_.IsRest(number_))
-            return;
-        const int64_t planned = plan_.pictures[static_cast<std::size_t>(number_)].pictures;
-        if (pictures_ == planned || (pictures_ < planned && verdict.damaged > 0))
-            return;
-        throw Failure(Category::kSource,
-                      fmt::format("piece {} has {} pictures, {} were planned: \"{}\" holds others than its "
-                                  "stamps tell, and can only be converted undivided",
-                                  number_, pictures_, planned, plan_.source.path));
+    int64_t Planned() const { return foreman_.plan_.pictures[static_cast<std::size_t>(number_)].pictures; }
+
+    /// Whether not every planned picture was taken, though the source is not damaged there. That can be
+    /// because decoding began at a key picture after which a decoder keeps pictures back.
+    bool Lacks(const Verdict& verdict) const {
+        if (foreman_.plan_.IsRest(number_))
+            return false;
+        if (verdict.outcome == Outcome::kDone)
+            return pictures_ != Planned() && (pictures_ > Planned() || verdict.damaged == 0);
+        return verdict.failure && verdict.failure->Kind() == Category::kSource;
     }
 
-    Outlet& news_;
-    const Plan& plan_;
-    const std::string& planPath_;
+    Foreman& foreman_;
     const int number_;
     const std::string file_;
     const double length_;
+    const bool fromStart_;
     int64_t pictures_ = 0;
 };
-
-} // namespace
 
 std::string PlanPathFor(const std::string& output) {
     return output + ".plan";
@@ -249,14 +251,24 @@ std::optional<Crew::Assignment> Foreman::Next() {
     if (!plan_.IsRest(number))
         length = LengthOf(plan_.pictures[static_cast<std::size_t>(number)]);
     const std::string file = NameInTheMaking(PiecePath(order_.planPath, number));
-    return Assignment{RequestOf(order_, plan_, number, file),
-                      std::make_unique<PieceErrand>(News(), plan_, order_.planPath, number, file, length)};
+    const bool fromStart = plan_.fromStart || fromStart_.count(number) > 0;
+    Request request = RequestOf(order_, plan_, number, file);
+    request.piece->fromStart = fromStart;
+    return Assignment{request, std::make_unique<PieceErrand>(*this, number, file, length, fromStart)};
+}
+
+std::set<int> Foreman::TakeLacking() {
+    const std::lock_guard lock(mutex_);
+    return std::exchange(lacking_, {});
 }
 
 /// The first failure stays.
 void Foreman::Take(const std::string& /*input*/, const Verdict& ending) {
+    for (const int number : TakeLacking())
+        if (fromStart_.insert(number).second)
+            missing_.push_front(number);
     if (ending.outcome == Outcome::kDone) {
-        ++verdict_.files;
+        verdict_.files += ending.files;
         bytes_ += ending.bytes;
         done_ += ending.position;
     } else if (verdict_.outcome == Outcome::kDone || (ending.failure && !verdict_.failure)) {

@@ -6,7 +6,9 @@
 #include "host/pieces/Plan.h"
 
 #include <deque>
+#include <mutex>
 #include <optional>
+#include <set>
 #include <string>
 
 namespace movieconv {
@@ -35,6 +37,8 @@ public:
     ~Foreman() override { Finish(); }
 
 private:
+    class PieceErrand;
+
     Verdict Perform() override;
     Mood HowToGoOn() const override;
     bool HasMore() const override { return !missing_.empty(); }
@@ -45,6 +49,7 @@ private:
     std::optional<Plan> Prepare();
     std::optional<Plan> Leftover(const Plan& now);
     std::deque<int> FindMissing() const;
+    std::set<int> TakeLacking();
     void Announce();
     int JobsFor();
     void ReportFinishing(double share);
@@ -55,8 +60,12 @@ private:
     // The foreman's thread's, and read by the pieces' threads while pieces are made.
     Plan plan_;
 
+    std::mutex mutex_;      // guards this
+    std::set<int> lacking_; // pieces that lack pictures, so far
+
     // The foreman's thread's.
     std::deque<int> missing_; // pieces that are to be begun
+    std::set<int> fromStart_; // of these, those for which the source is read from its start
     Verdict verdict_;
     double length_ = 0; // seconds of all pictures to be converted
     double done_ = 0;   // of the pieces that are made

@@ -17,6 +17,8 @@ extern "C" {
 
 namespace packets {
 
+constexpr int kEmptyText = 2; // bytes, which tell its length
+
 inline std::size_t HashOf(const uint8_t* data, std::size_t size) {
     return std::hash<std::string>()(std::string(reinterpret_cast<const char*>(data), size));
 }
@@ -53,6 +55,10 @@ inline std::vector<std::string> Of(const std::string& path) {
     const av::Packet packet = av::NewPacket();
     while (av_read_frame(context, packet.get()) >= 0) {
         const AVStream& stream = *context->streams[packet->stream_index];
+        if (stream.codecpar->codec_id == AV_CODEC_ID_MOV_TEXT && packet->size <= kEmptyText) {
+            av_packet_unref(packet.get()); // the time between two texts may be told in parts
+            continue;
+        }
         std::size_t content = 0;
         if (stream.codecpar->codec_type != AVMEDIA_TYPE_VIDEO)
             content = HashOf(packet->data, static_cast<std::size_t>(packet->size));

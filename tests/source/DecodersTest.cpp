@@ -37,6 +37,11 @@ std::string CountedMkv() {
     return Make("counted.mkv", Join(CountedPictures(4), Beeps(4),
                                     Args{"-c:v", "mpeg4", "-q:v", "2", "-g", "30", "-c:a", "pcm_s16le"}));
 }
+std::string CountedMpeg4Ts() {
+    return Make("counted-mpeg4.ts",
+                Join(CountedPictures(4), Beeps(4),
+                     Args{"-c:v", "mpeg4", "-q:v", "2", "-bf", "1", "-g", "51", "-c:a", "mp2"}));
+}
 std::string CountedFromTen() {
     return Make("from-ten.mkv", {"-i", CountedMkv(), "-c", "copy", "-output_ts_offset", "10"});
 }
@@ -55,6 +60,7 @@ const Begin kBegins[] = {
     {"NearTheStart", Counted4s, 0.05, 1},
     {"TransportStream", CountedTs, 2.5, 62},
     {"TransportStreamBeforeItsSecondKeyPicture", CountedTs, 0.83, 20},
+    {"TransportStreamThatIsSoughtBetweenKeyPictures", CountedMpeg4Ts, 2.25, 56},
     {"Matroska", CountedMkv, 2.41, 60},
     {"ClockThatStartsAtTenSeconds", CountedFromTen, 2.41, 60},
     {"AsfThatAnnouncesItsLastStamp", CountedAsfFromTen, 2.41, 60},
