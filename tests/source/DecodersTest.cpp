@@ -60,7 +60,7 @@ const Begin kBegins[] = {
     {"NearTheStart", Counted4s, 0.05, 1},
     {"TransportStream", CountedTs, 2.5, 62},
     {"TransportStreamBeforeItsSecondKeyPicture", CountedTs, 0.83, 20},
-    {"TransportStreamThatIsSoughtBetweenKeyPictures", CountedMpeg4Ts, 2.25, 56},
+    {"TransportStreamThatIsSoughtBetweenKeyPictures", CountedMpeg4Ts, 2.27, 56},
     {"Matroska", CountedMkv, 2.41, 60},
     {"ClockThatStartsAtTenSeconds", CountedFromTen, 2.41, 60},
     {"AsfThatAnnouncesItsLastStamp", CountedAsfFromTen, 2.41, 60},
