@@ -33,8 +33,7 @@ void PutPictures(EncodeParam& param, const FileFormatInfo& format, const Request
     param.bResize = request.fit == Fit::kStretch ? 1 : 0;
     if (plan.frameRate) // no reference to the record's double, which lies on a 4-byte boundary
         param.dFrameRate = *plan.frameRate;
-    else if ((MWGetFormatTraits(format.fccFormat) & kWriterFormatSteadyRate) != 0 &&
-             source.frameRate <= kHighestFrameRate)
+    else if ((MWGetFormatTraits(format.fccFormat) & kWriterFormatSteadyRate) != 0)
         param.dFrameRate = std::min(source.peakRate, kHighestFrameRate);
     param.nVideoBitrate = plan.rate.value_or(param.nVideoBitrate);
     param.nVideoMaxBitrate = plan.maxRate.value_or(0);

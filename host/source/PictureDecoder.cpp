@@ -46,7 +46,7 @@ PictureDecoder::PictureDecoder(const Source& source, Demuxer& demuxer, Failures&
              {L"Movie::The picture decoder waits for the conversion",
               L"Movie::The conversion waits for the picture decoder"}) {
     const PictureStreamInfo& pictures = *source.Info().pictures;
-    info_.format = {pictures.width, pictures.height, pictures.frameRate,
+    info_.format = {pictures.width, pictures.height, CredibleRate(pictures),
                     std::max(pictures.duration, kShortestTold)};
 }
 

@@ -21,7 +21,7 @@ PictureStamps::PictureStamps(const Source& source, Demuxer& demuxer)
       codec_(source.PictureStream()->codecpar->codec_id),
       repair_(ToMediaTime(1 / source.Info().pictures->frameRate)) {
     const PictureStreamInfo& pictures = *source.Info().pictures;
-    info_.format = {pictures.width, pictures.height, pictures.frameRate, pictures.duration};
+    info_.format = {pictures.width, pictures.height, CredibleRate(pictures), pictures.duration};
 }
 
 double PictureStamps::Seek(double seconds, int /*mode*/) {

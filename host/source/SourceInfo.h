@@ -7,7 +7,9 @@
 #include "host/source/Crop.h"
 #include "host/source/Deinterlace.h"
 #include "host/source/TrackWishes.h"
+#include "media/Limits.h"
 
+#include <algorithm>
 #include <cstdint>
 #include <optional>
 #include <string>
@@ -44,11 +46,12 @@ struct LightLevel {
 };
 
 struct PictureStreamInfo {
-    int index = -1;          ///< Stream number in the container.
-    std::string codec;       ///< Codec name, "h264".
-    std::string pixelFormat; ///< FFmpeg's name, "yuv420p".
-    int depth = 8;           ///< Bits of a component.
-    int width = 0;           ///< As shown, after rotation and cropping.
+    int index = -1;           ///< Stream number in the container.
+    std::string codec;        ///< Codec name, "h264".
+    std::string pixelFormat;  ///< FFmpeg's name, "yuv420p".
+    int depth = 8;            ///< Bits of a component.
+    bool transparent = false; ///< Has a plane of opacity, which no conversion carries.
+    int width = 0;            ///< As shown, after rotation and cropping.
     int height = 0;
     int quarterTurns = 0;  ///< Clockwise turns by 90 degrees that bring the stored picture upright.
     bool mirrored = false; ///< The stored picture is mirrored left to right before it is turned.
@@ -76,6 +79,12 @@ constexpr int kHybridLogGamma = 18;
 /// Whether the pictures are made for more light and colour than usual displays have.
 inline bool IsHdr(const PictureStreamInfo& pictures) {
     return pictures.colorTransfer == kPerceptualQuantizer || pictures.colorTransfer == kHybridLogGamma;
+}
+
+/// Pictures per second as the engine is told. It takes a higher rate for a mistake, and would have 30 made;
+/// told this one, every picture is kept with its own time.
+inline double CredibleRate(const PictureStreamInfo& pictures) {
+    return std::min(pictures.frameRate, kHighestFrameRate);
 }
 
 struct SoundStreamInfo {

@@ -6,6 +6,7 @@
 #include <algorithm>
 #include <array>
 #include <cmath>
+#include <cstring>
 #include <string_view>
 #include <utility>
 
@@ -117,6 +118,17 @@ void ReadLight(const AVStream* stream, PictureStreamInfo& info) {
     info.dolbyVision = sideData(AV_PKT_DATA_DOVI_CONF) != nullptr;
 }
 
+/// Opacity beside VP9's pictures is told by a tag only. A GIF's pixels always have room for it, and hardly
+/// ever use it.
+bool HasOpacity(const AVStream* stream, const AVPixFmtDescriptor& format) {
+    const AVDictionaryEntry* tag = av_dict_get(stream->metadata, "alpha_mode", nullptr, 0);
+    const bool isTagged = tag != nullptr && std::strcmp(tag->value, "1") == 0;
+    const bool isInPixels = (format.flags & AV_PIX_FMT_FLAG_ALPHA) != 0 &&
+                            (format.flags & AV_PIX_FMT_FLAG_PAL) == 0 &&
+                            stream->codecpar->codec_id != AV_CODEC_ID_GIF;
+    return isTagged || isInPixels;
+}
+
 PictureStreamInfo DescribePictures(AVFormatContext& context, AVStream* stream) {
     const AVCodecParameters& parameters = *stream->codecpar;
     PictureStreamInfo info;
@@ -126,6 +138,7 @@ PictureStreamInfo DescribePictures(AVFormatContext& context, AVStream* stream) {
             av_pix_fmt_desc_get(static_cast<AVPixelFormat>(parameters.format))) {
         info.pixelFormat = format->name;
         info.depth = format->comp[0].depth;
+        info.transparent = HasOpacity(stream, *format);
     } else {
         info.pixelFormat = "unknown";
     }

@@ -1,0 +1,54 @@
+// Pictures that come faster than the engine believes, and pictures that one can look through.
+#include "tests/support/Inspect.h"
+#include "tests/support/Program.h"
+#include "tests/support/TestMovies.h"
+
+#include <gtest/gtest.h>
+
+#include <string>
+
+namespace {
+
+using namespace test_movies;
+using program::Call;
+using program::Result;
+
+TEST(UnusualPictures, SlowMotionKeepsEveryPictureWithItsTime) {
+    const std::string source =
+        Make("240-a-second.mp4", Join(CountedPictures(1, "240"), Args{"-c:v", "mpeg4"}));
+    const inspect::Seen before = inspect::LookAt(source);
+    ASSERT_EQ(before.pictures.size(), 240u);
+    for (const char* const name : {"o.mp4", "o.mkv", "o.ts"}) {
+        SCOPED_TRACE(name);
+        const Folder folder;
+        const Result result = Call({"--preset", "classic", source, folder / name});
+        ASSERT_EQ(result.code, 0) << result.err;
+        const inspect::Seen after = inspect::LookAt(folder / name);
+        ASSERT_EQ(after.pictures.size(), before.pictures.size());
+        for (std::size_t i = 0; i < before.pictures.size(); ++i)
+            EXPECT_NEAR(after.pictures[i].time - after.pictures[0].time, i / 240.0, 0.0011) << i;
+    }
+}
+
+TEST(UnusualPictures, TransparencyIsSaidToBeLeftOut) {
+    const struct {
+        const char* name;
+        Args encoding;
+        bool told;
+    } cases[] = {
+        {"see-through.mkv", {"-c:v", "ffv1", "-pix_fmt", "yuva420p"}, true},
+        {"see-through.webm", {"-c:v", "libvpx-vp9", "-cpu-used", "8", "-pix_fmt", "yuva420p"}, true},
+        {"palette.gif", {}, false},
+        {"opaque.mkv", {"-c:v", "ffv1", "-pix_fmt", "yuv420p"}, false},
+    };
+    for (const auto& test : cases) {
+        SCOPED_TRACE(test.name);
+        const Folder folder;
+        const std::string source = Make(test.name, Join(CountedPictures(0.2), test.encoding));
+        const Result result = Call({"--preset", "classic", source, folder / "o.mp4"});
+        ASSERT_EQ(result.code, 0) << result.err;
+        EXPECT_EQ(result.err.find("transparency") != std::string::npos, test.told) << result.err;
+    }
+}
+
+} // namespace
