@@ -161,6 +161,9 @@ std::vector<std::string> Movie::Complaints() const {
         texts.emplace_back("its HDR pictures were brought to the light and colours of BT.709");
     else if (pictures_ && Info().pictures->depth > 8 && !choice_.deep)
         texts.push_back(fmt::format("its pictures of {} bits got 8", Info().pictures->depth));
+    if (pictures_ && !Info().pictures->fineColours.empty())
+        texts.push_back(fmt::format("its {} pictures keep their colours at half the resolution (4:2:0)",
+                                    Info().pictures->fineColours));
     if (pictures_ && Info().pictures->transparent)
         texts.emplace_back("the transparency of its pictures was left out");
     if (const int jumps = demuxer_.ClockJumps(); jumps > 0) {

@@ -51,6 +51,7 @@ struct PictureStreamInfo {
     std::string pixelFormat;  ///< FFmpeg's name, "yuv420p".
     int depth = 8;            ///< Bits of a component.
     bool transparent = false; ///< Has a plane of opacity, which no conversion carries.
+    std::string fineColours;  ///< "4:2:2", "RGB": finer than the 4:2:0 that is written; empty when not.
     int width = 0;            ///< As shown, after rotation and cropping.
     int height = 0;
     int quarterTurns = 0;  ///< Clockwise turns by 90 degrees that bring the stored picture upright.

@@ -129,6 +129,17 @@ bool HasOpacity(const AVStream* stream, const AVPixFmtDescriptor& format) {
     return isTagged || isInPixels;
 }
 
+/// Empty where half the resolution in both directions, or none, is all there is.
+std::string FinerThanHalf(const AVPixFmtDescriptor& format) {
+    if ((format.flags & (AV_PIX_FMT_FLAG_RGB | AV_PIX_FMT_FLAG_PAL)) != 0)
+        return "RGB";
+    if (format.nb_components < 3 || (format.log2_chroma_w > 0 && format.log2_chroma_h > 0))
+        return "";
+    if (format.log2_chroma_w == 0)
+        return format.log2_chroma_h == 0 ? "4:4:4" : "4:4:0";
+    return format.log2_chroma_w == 1 ? "4:2:2" : "4:1:1";
+}
+
 PictureStreamInfo DescribePictures(AVFormatContext& context, AVStream* stream) {
     const AVCodecParameters& parameters = *stream->codecpar;
     PictureStreamInfo info;
@@ -138,6 +149,7 @@ PictureStreamInfo DescribePictures(AVFormatContext& context, AVStream* stream) {
             av_pix_fmt_desc_get(static_cast<AVPixelFormat>(parameters.format))) {
         info.pixelFormat = format->name;
         info.depth = format->comp[0].depth;
+        info.fineColours = FinerThanHalf(*format);
         info.transparent = HasOpacity(stream, *format);
     } else {
         info.pixelFormat = "unknown";

@@ -1,4 +1,4 @@
-// Pictures that come faster than the engine believes, and pictures that one can look through.
+// Pictures that come faster than the engine believes, that one can look through, or whose colours are finer.
 #include "tests/support/Inspect.h"
 #include "tests/support/Program.h"
 #include "tests/support/TestMovies.h"
@@ -30,16 +30,22 @@ TEST(UnusualPictures, SlowMotionKeepsEveryPictureWithItsTime) {
     }
 }
 
-TEST(UnusualPictures, TransparencyIsSaidToBeLeftOut) {
+TEST(UnusualPictures, WhatTheyLoseIsTold) {
     const struct {
         const char* name;
         Args encoding;
-        bool told;
+        bool transparent;
+        const char* colours; // finer than those that are written; null when they are not
     } cases[] = {
-        {"see-through.mkv", {"-c:v", "ffv1", "-pix_fmt", "yuva420p"}, true},
-        {"see-through.webm", {"-c:v", "libvpx-vp9", "-cpu-used", "8", "-pix_fmt", "yuva420p"}, true},
-        {"palette.gif", {}, false},
-        {"opaque.mkv", {"-c:v", "ffv1", "-pix_fmt", "yuv420p"}, false},
+        {"see-through.mkv", {"-c:v", "ffv1", "-pix_fmt", "yuva420p"}, true, nullptr},
+        {"see-through.webm", {"-c:v", "libvpx-vp9", "-cpu-used", "8", "-pix_fmt", "yuva420p"}, true, nullptr},
+        {"palette.gif", {}, false, "RGB"},
+        {"fine.mkv", {"-c:v", "ffv1", "-pix_fmt", "yuv444p"}, false, "4:4:4"},
+        {"fine.mov", {"-c:v", "prores_ks"}, false, "4:2:2"},
+        {"old.mkv", {"-c:v", "ffv1", "-pix_fmt", "yuv411p"}, false, "4:1:1"},
+        {"coarse.mkv", {"-c:v", "ffv1", "-pix_fmt", "yuv410p"}, false, nullptr},
+        {"grey.mkv", {"-c:v", "ffv1", "-pix_fmt", "gray"}, false, nullptr},
+        {"plain.mkv", {"-c:v", "ffv1", "-pix_fmt", "yuv420p"}, false, nullptr},
     };
     for (const auto& test : cases) {
         SCOPED_TRACE(test.name);
@@ -47,7 +53,13 @@ TEST(UnusualPictures, TransparencyIsSaidToBeLeftOut) {
         const std::string source = Make(test.name, Join(CountedPictures(0.2), test.encoding));
         const Result result = Call({"--preset", "classic", source, folder / "o.mp4"});
         ASSERT_EQ(result.code, 0) << result.err;
-        EXPECT_EQ(result.err.find("transparency") != std::string::npos, test.told) << result.err;
+        const auto tells = [&](const std::string& text) {
+            return result.err.find(text) != std::string::npos;
+        };
+        EXPECT_EQ(tells("transparency"), test.transparent) << result.err;
+        EXPECT_EQ(tells("(4:2:0)"), test.colours != nullptr) << result.err;
+        if (test.colours)
+            EXPECT_TRUE(tells(std::string("its ") + test.colours + " pictures")) << result.err;
     }
 }
 
