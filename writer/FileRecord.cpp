@@ -17,7 +17,7 @@ FileRecord::FileRecord(uint32_t set, int sequence, std::string_view path, const 
     status_.nSet = set;
     status_.nSequence = sequence;
     status_.nState = kWriterFileWriting;
-    CopyText(status_.szPath, sizeof status_.szPath, path);
+    text::CopyText(status_.szPath, path);
 }
 
 WriterStatus FileRecord::Snapshot() const {
@@ -37,7 +37,7 @@ bool FileRecord::Fail(const WriterFailure& failure) noexcept {
             return false;
         status_.nError = failure.Kind();
         status_.nSystemError = failure.SystemError();
-        CopyText(status_.szWhat, sizeof status_.szWhat, failure.what());
+        text::CopyText(status_.szWhat, failure.what());
     }
     WriteLog(kLogError, "Failed: %s: %s", status_.szPath, failure.what());
     return true;
@@ -50,7 +50,7 @@ bool FileRecord::Failed() const {
 
 void FileRecord::SetTemporaryPath(std::string_view path) {
     const std::lock_guard lock(mutex_);
-    CopyText(status_.szTemporaryPath, sizeof status_.szTemporaryPath, path);
+    text::CopyText(status_.szTemporaryPath, path);
 }
 
 void FileRecord::Tell(int event) const {

@@ -1,6 +1,8 @@
 #include "writer/FileSystem.h"
 
 #include "text/FileNames.h"
+#include "text/Path.h"
+#include "text/Utf8.h"
 
 #include <algorithm>
 #include <array>
@@ -139,16 +141,6 @@ public:
     }
 };
 
-/// `name` cut to at most `size` bytes without leaving half a UTF-8 character.
-std::string CutName(const std::string& name, size_t size) {
-    if (name.size() <= size)
-        return name;
-    size_t end = size;
-    while (end > 0 && (static_cast<unsigned char>(name[end]) & 0xC0) == 0x80)
-        --end;
-    return name.substr(0, end);
-}
-
 } // namespace
 
 FileSystem& SystemFiles() {
@@ -174,13 +166,14 @@ std::string ResolveTarget(const std::string& path) {
 
 std::unique_ptr<ByteFile> CreateBeside(FileSystem& files, const std::string& target, std::string& path,
                                        int& error) {
-    const size_t nameAt = target.rfind('/') == std::string::npos ? 0 : target.rfind('/') + 1;
-    const long told = pathconf(nameAt == 0 ? "." : target.substr(0, nameAt).c_str(), _PC_NAME_MAX);
+    const std::string name = text::NameOf(target);
+    const std::string folder = target.substr(0, target.size() - name.size());
+    const long told = pathconf(text::FolderOf(target).c_str(), _PC_NAME_MAX);
     // Some file systems count characters and tell the most bytes that those may have.
     const size_t longest = told > 0 ? std::min<size_t>(static_cast<size_t>(told), NAME_MAX) : NAME_MAX;
     for (int number = 1; number <= text::kMostPartials; ++number) {
         const std::string tail = text::PartialSuffix(number);
-        path = target.substr(0, nameAt) + CutName(target.substr(nameAt), longest - tail.size()) + tail;
+        path = folder + std::string(text::CutTo(longest - tail.size(), name)) + tail;
         std::unique_ptr<ByteFile> file = files.Create(path, target, error);
         if (file || error != EEXIST)
             return file;

@@ -28,8 +28,7 @@ std::string KeyOf(const std::string& target) {
     struct stat folder {};
     if (stat(text::FolderOf(target).c_str(), &folder) != 0)
         return target; // which cannot be created
-    return std::to_string(folder.st_dev) + ":" + std::to_string(folder.st_ino) + "/" +
-           target.substr(target.rfind('/') + 1);
+    return std::to_string(folder.st_dev) + ":" + std::to_string(folder.st_ino) + "/" + text::NameOf(target);
 }
 
 } // namespace

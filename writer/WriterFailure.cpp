@@ -4,20 +4,13 @@
 #include <array>
 #include <cerrno>
 #include <cstdarg>
+#include <cstddef>
 #include <cstdio>
 #include <cstring>
 #include <new>
 #include <system_error>
 
 namespace writer {
-
-void CopyText(char* to, size_t size, std::string_view text) noexcept {
-    size_t length = std::min(text.size(), size - 1);
-    while (length < text.size() && length > 0 && (static_cast<unsigned char>(text[length]) & 0xC0) == 0x80)
-        --length;
-    std::memcpy(to, text.data(), length);
-    to[length] = '\0';
-}
 
 WriterFailure SystemFailure(int kind, int error, const char* format, ...) noexcept {
     std::array<char, kWriterPathSize> what;

@@ -2,17 +2,13 @@
 #ifndef MOVIECONV_WRITER_WRITERFAILURE_H
 #define MOVIECONV_WRITER_WRITERFAILURE_H
 
+#include "text/Utf8.h"
 #include "writer/WriterStatus.h"
 
-#include <cstddef>
 #include <exception>
 #include <string_view>
 
 namespace writer {
-
-/// Copies as much as fits into the `size` bytes of `to`, without leaving half a UTF-8 character, always
-/// terminated.
-void CopyText(char* to, size_t size, std::string_view text) noexcept;
 
 /// Why a file could not be created or written, in the terms of writer/WriterStatus.h. Holds its text itself:
 /// that there is no memory has to be said without any.
@@ -21,7 +17,7 @@ public:
     /// `kind` is a kWriterError code, `what` a sentence for users, `systemError` an errno or 0.
     WriterFailure(int kind, std::string_view what, int systemError = 0) noexcept
         : kind_(kind), systemError_(systemError) {
-        CopyText(what_, sizeof what_, what);
+        text::CopyText(what_, what);
     }
 
     const char* what() const noexcept override { return what_; }

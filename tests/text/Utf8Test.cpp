@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include <iterator>
 #include <random>
 #include <string>
 
@@ -34,6 +35,18 @@ TEST(Utf8, AnyBytesSurviveTheRoundTrip) {
             value = static_cast<char>(round % 2 == 0 ? byte(random) : high(random));
         EXPECT_EQ(text::ToUtf8(text::FromUtf8(bytes)), bytes);
     }
+}
+
+TEST(Utf8, IsCutBetweenCharacters) {
+    const std::string letters = "a\xC3\xA9\xE2\x82\xAC"; // of one, two and three bytes
+    const std::size_t sizes[] = {0, 1, 1, 3, 3, 3, 6, 6};
+    for (std::size_t most = 0; most < std::size(sizes); ++most)
+        EXPECT_EQ(text::CutTo(most, letters), letters.substr(0, sizes[most])) << most;
+    char copy[6];
+    text::CopyText(copy, letters);
+    EXPECT_STREQ(copy, "a\xC3\xA9");
+    text::CopyText(copy, "five!");
+    EXPECT_STREQ(copy, "five!");
 }
 
 } // namespace

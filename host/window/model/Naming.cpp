@@ -1,6 +1,7 @@
 #include "host/window/model/Naming.h"
 
 #include "text/Path.h"
+#include "text/Utf8.h"
 
 #include <QDate>
 
@@ -12,7 +13,7 @@ namespace {
 constexpr size_t kLongestName = 240; // of 255 bytes: the rest is for the temporary file's ending
 
 std::string Stem(const std::string& path) {
-    const std::string name = path.substr(path.rfind('/') + 1);
+    const std::string name = text::NameOf(path);
     const size_t dot = name.rfind('.');
     return dot == std::string::npos || dot == 0 ? name : name.substr(0, dot);
 }
@@ -20,16 +21,6 @@ std::string Stem(const std::string& path) {
 void ReplaceAll(std::string& text, const std::string& mark, const std::string& value) {
     for (size_t at = text.find(mark); at != std::string::npos; at = text.find(mark, at + value.size()))
         text.replace(at, mark.size(), value);
-}
-
-/// Not through the middle of a character.
-std::string Cut(const std::string& text, size_t most) {
-    if (text.size() <= most)
-        return text;
-    size_t size = most;
-    while (size > 0 && (static_cast<unsigned char>(text[size]) & 0xC0) == 0x80)
-        --size;
-    return text.substr(0, size);
 }
 
 std::string Fill(const Entry& entry, const QString& pattern) {
@@ -55,7 +46,8 @@ std::string TargetFor(const Entry& entry, const Naming& naming, const QString& e
     do {
         const std::string ending = (number > 1 ? " (" + std::to_string(number) + ")" : std::string()) + "." +
                                    extension.toStdString();
-        path = (folder == "/" ? folder : folder + "/") + Cut(stem, kLongestName - ending.size()) + ending;
+        path = (folder == "/" ? folder : folder + "/") +
+               std::string(text::CutTo(kLongestName - ending.size(), stem)) + ending;
         ++number;
     } while (isTaken(path));
     return path;
