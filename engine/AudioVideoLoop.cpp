@@ -224,14 +224,8 @@ void ConvThread::AudioVideoLoop::WritePicture(const VideoImage& picture) {
     copy.llTime = WrapAdd(copy.llTime, llVideoShift);
     Send(copy);
 
-    const int64_t shift = clock.Shift();
-    if (std::abs(shift) <= kShiftTold)
-        return;
-    converter.results.Update([shift](MCResult& result) {
-        ++result.llPicturesRestamped;
-        if (std::abs(shift) > std::abs(result.llLargestShift))
-            result.llLargestShift = shift;
-    });
+    if (const int64_t shift = clock.Shift(); std::abs(shift) > kShiftTold)
+        converter.results.CountRestamped(shift);
 }
 
 void ConvThread::AudioVideoLoop::TellShift() {

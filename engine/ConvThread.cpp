@@ -12,6 +12,10 @@
 
 namespace {
 
+// Bits per second of sound in parameters that leave it at 0: half of what a converter begins with. Hosts
+// count on both figures.
+constexpr int32_t kCompletedAudioBitrate = 64'000;
+
 EncodeParam DefaultEncodeParam() {
     EncodeParam param{};
     param.fccVideo = FourCC("XVID");
@@ -65,7 +69,7 @@ void CompleteFrom(const AudioFormat& source, EncodeParam& param) {
     if (param.nBitsPerSample == 0)
         param.nBitsPerSample = source.nBitsPerSample;
     if (param.nAudioBitrate == 0)
-        param.nAudioBitrate = 64000;
+        param.nAudioBitrate = kCompletedAudioBitrate;
 }
 
 /// The four characters of a code as text.

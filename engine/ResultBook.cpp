@@ -1,23 +1,10 @@
 #include "engine/ResultBook.h"
 
 #include "engine/ProgressInfo.h"
+#include "text/Utf8.h"
 
 #include <algorithm>
 #include <cstring>
-
-namespace {
-
-/// Copies what fits and ends it between two characters.
-template <size_t N>
-void CopyText(char (&to)[N], const char* from) {
-    size_t length = std::min(std::strlen(from), N - 1);
-    while (from[length] != '\0' && length > 0 && (from[length] & 0xC0) == 0x80)
-        --length;
-    std::memcpy(to, from, length);
-    to[length] = '\0';
-}
-
-} // namespace
 
 void ResultBook::Begin() {
     const CSingleLock guard(&lock);
@@ -25,7 +12,8 @@ void ResultBook::Begin() {
     result.nSize = sizeof result;
     result.nCategory = MC_RESULT_RUNNING;
     result.nOutcome = -1;
-    for (Count* const count : {&picturesSent, &picturesRefused, &samplesSent, &samplesRefused})
+    for (Count* const count :
+         {&picturesSent, &picturesRefused, &samplesSent, &samplesRefused, &picturesRestamped, &largestShift})
         *count = 0;
 }
 
@@ -39,8 +27,8 @@ void ResultBook::FailLocked(int category, const char* what, const char* path, in
         return;
     result.nCategory = category;
     result.nSystemError = systemError;
-    CopyText(result.szWhat, what);
-    CopyText(result.szPath, path);
+    text::CopyText(result.szWhat, what);
+    text::CopyText(result.szPath, path);
 }
 
 void ResultBook::End(unsigned outcome, bool pictures) {
@@ -73,6 +61,8 @@ bool ResultBook::Copy(MCResult* to) const {
     now.llPicturesRefused = picturesRefused;
     now.llSamplesSent = samplesSent;
     now.llSamplesRefused = samplesRefused;
+    now.llPicturesRestamped = picturesRestamped;
+    now.llLargestShift = largestShift;
     std::memcpy(to, &now, size);
     return true;
 }

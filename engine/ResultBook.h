@@ -7,6 +7,7 @@
 
 #include <atomic>
 #include <cstdint>
+#include <cstdlib>
 
 #include <pthread.h>
 
@@ -39,6 +40,13 @@ public:
         Raise(samplesRefused, taken ? 0 : samples);
     }
 
+    /// Counts a picture that was moved by `shift`, in 100 ns. Likewise.
+    void CountRestamped(int64_t shift) {
+        Raise(picturesRestamped, 1);
+        if (std::abs(shift) > std::abs(largestShift.load(std::memory_order_relaxed)))
+            largestShift.store(shift, std::memory_order_relaxed);
+    }
+
     /// Changes other figures.
     template <class Change>
     void Update(Change change) {
@@ -64,6 +72,8 @@ private:
     Count picturesRefused{0};
     Count samplesSent{0};
     Count samplesRefused{0};
+    Count picturesRestamped{0};
+    Count largestShift{0};
 };
 
 #endif
