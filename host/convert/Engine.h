@@ -17,8 +17,7 @@ struct EngineDestroy {
 using Engine = std::unique_ptr<void, EngineDestroy>;
 
 /// A converter for these decoders of the source, with its parameters set as the request asks, for files with
-/// these options of the writer; with a split it makes one clip at
-/// a time. It posts no events. Throws Failure.
+/// these options of the writer; with a split it makes one clip at a time. It posts no events. Throws Failure.
 Engine MakeEngine(const Request& request, const SourceInfo& source, VideoDecoder* pictures,
                   AudioDecoder* sound, uint32_t writerSet = kWriterDefaultSet);
 

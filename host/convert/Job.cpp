@@ -3,14 +3,14 @@
 #include "host/convert/Attempt.h"
 #include "host/convert/Course.h"
 #include "host/convert/EncodePlan.h"
+#include "host/convert/Ending.h"
 #include "host/convert/Outlet.h"
 #include "host/convert/OutputCheck.h"
 #include "host/convert/Sources.h"
 
 #include <algorithm>
-#include <condition_variable>
+#include <atomic>
 #include <mutex>
-#include <new>
 #include <sys/resource.h>
 #include <thread>
 #include <utility>
@@ -43,24 +43,23 @@ public:
 
     /// The source is interrupted only while it is opened: afterwards it is the course that stops it.
     void Stop() {
-        wishes_.stop = true;
-        wishes_.bell.Ring();
+        Want(&Wishes::stop);
         const std::lock_guard lock(mutex_);
         if (opening_)
             opening_->Interrupt();
     }
 
-    Wishes& WhatIsWanted() { return wishes_; }
-
-    void Wait() {
-        std::unique_lock lock(mutex_);
-        end_.wait(lock, [this] { return ended_; });
+    void Want(std::atomic<bool> Wishes::*wish, bool on = true) {
+        wishes_.*wish = on;
+        wishes_.bell.Ring();
+    }
+    void ShowPictures(PictureTap::Interval interval) {
+        wishes_.pictures.SetInterval(interval);
+        wishes_.bell.Ring();
     }
 
-    const Verdict* Result() const {
-        const std::lock_guard lock(mutex_);
-        return ended_ ? &verdict_ : nullptr;
-    }
+    void Wait() { ending_.Wait(); }
+    const Verdict* Result() const { return ending_.Result(); }
 
 private:
     void Run() noexcept;
@@ -70,28 +69,16 @@ private:
     const Request request_;
     Outlet outlet_;
     Wishes wishes_;
-    mutable std::mutex mutex_;
+    std::mutex mutex_;                      // guards this:
     std::shared_ptr<Interruption> opening_; // null unless the source is being opened
-    std::condition_variable end_;
-    bool ended_ = false;
-    Verdict verdict_;
+    Ending ending_;
     std::thread thread_;
 };
 
 void Job::Impl::Run() noexcept {
     StandBack(request_.niceness);
     // cppcheck-suppress throwInNoexceptFunction ; Attempt catches it
-    Verdict verdict = Attempt(*this, &Impl::Convert);
-    {
-        const std::lock_guard lock(mutex_);
-        verdict_ = std::move(verdict);
-        ended_ = true;
-    }
-    end_.notify_all();
-    try {
-        outlet_.Ended(verdict_);
-    } catch (const std::bad_alloc&) { // Result tells it
-    }
+    ending_.Come(Attempt(*this, &Impl::Convert), outlet_);
 }
 
 Verdict Job::Impl::Convert() {
@@ -133,13 +120,11 @@ void Job::Start() {
 }
 
 void Job::Pause() {
-    impl_->WhatIsWanted().pause = true;
-    impl_->WhatIsWanted().bell.Ring();
+    impl_->Want(&Wishes::pause);
 }
 
 void Job::Resume() {
-    impl_->WhatIsWanted().pause = false;
-    impl_->WhatIsWanted().bell.Ring();
+    impl_->Want(&Wishes::pause, false);
 }
 
 void Job::Stop() {
@@ -147,18 +132,15 @@ void Job::Stop() {
 }
 
 void Job::RetryWrite() {
-    impl_->WhatIsWanted().retryWrite = true;
-    impl_->WhatIsWanted().bell.Ring();
+    impl_->Want(&Wishes::retryWrite);
 }
 
 void Job::GiveUpWrite() {
-    impl_->WhatIsWanted().giveUpWrite = true;
-    impl_->WhatIsWanted().bell.Ring();
+    impl_->Want(&Wishes::giveUpWrite);
 }
 
 void Job::ShowPictures(std::optional<std::chrono::milliseconds> interval) {
-    impl_->WhatIsWanted().pictures.SetInterval(interval);
-    impl_->WhatIsWanted().bell.Ring();
+    impl_->ShowPictures(interval);
 }
 
 void Job::Wait() {

@@ -27,13 +27,11 @@ public:
     /// Stops and waits for the end. No news comes afterwards. On the observer's thread.
     ~Job() override;
 
-    /// Begins, once. Throws std::system_error when there is no thread for it.
     void Start() override;
-
     void Pause() override;
     void Resume() override;
 
-    /// Ends the conversion: what was converted so far becomes a complete file, and the outcome is kStopped.
+    /// What was converted so far becomes a complete file.
     void Stop() override;
 
     /// While it waits for room on a full disk: try the write again now; or give up, and the file fails.
@@ -46,8 +44,6 @@ public:
     /// Waits until the conversion has ended. The last news may still wait in the loop.
     void Wait();
 
-    /// How it ended; null before. Stays valid as long as the job, and is there even when no memory was left
-    /// to tell the observer.
     const Verdict* Result() const override;
 
 private:

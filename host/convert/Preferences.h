@@ -47,8 +47,8 @@ struct Preferences {
     std::vector<uint32_t> videoCodecs; ///< The first that the format carries. Empty: the engine's choice.
     std::vector<uint32_t> audioCodecs;
 
-    std::map<uint32_t, Steps<double>>
-        quality;                      ///< By codec, by the height of the picture; see Request::quality.
+    /// By codec, by the height of the picture; see Request::quality.
+    std::map<uint32_t, Steps<double>> quality;
     std::optional<int32_t> videoRate; ///< Bits per second, where there is no quality.
     std::optional<int32_t> videoMaxRate;
     std::optional<Speed> speed;

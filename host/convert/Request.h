@@ -54,8 +54,7 @@ struct Request {
     std::string input;
     std::string output;
 
-    std::optional<uint32_t>
-        format; ///< Four-character code; see Formats.h. By default the output's name tells.
+    std::optional<uint32_t> format; ///< Four-character code; see Formats.h. By default by the output's name.
     std::optional<uint32_t> videoCodec; ///< Likewise; by default the format's usual one.
     std::optional<uint32_t> audioCodec;
     bool copySound = false; ///< Sound stays as it is coded, instead; its rates and channels are the source's.

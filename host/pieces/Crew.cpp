@@ -1,10 +1,9 @@
 #include "host/pieces/Crew.h"
 
 #include "host/convert/Attempt.h"
-#include "host/convert/Failure.h"
 
 #include <algorithm>
-#include <new>
+#include <mutex>
 #include <utility>
 
 namespace movieconv {
@@ -95,29 +94,18 @@ void Crew::Finish() {
 }
 
 const Verdict* Crew::Result() const {
-    const std::lock_guard lock(mutex_);
-    return ended_ ? &verdict_ : nullptr;
+    return ending_.Result();
 }
 
 void Crew::Wait() {
-    std::unique_lock lock(mutex_);
-    end_.wait(lock, [this] { return ended_; });
+    ending_.Wait();
 }
 
 void Crew::Run() noexcept {
     // cppcheck-suppress throwInNoexceptFunction ; Attempt catches it
     Verdict verdict = Attempt(*this, &Crew::Perform);
     hands_.clear();
-    {
-        const std::lock_guard lock(mutex_);
-        verdict_ = std::move(verdict);
-        ended_ = true;
-    }
-    end_.notify_all();
-    try {
-        outlet_.Ended(verdict_);
-    } catch (const std::bad_alloc&) { // Result tells it
-    }
+    ending_.Come(std::move(verdict), outlet_);
 }
 
 void Crew::WorkOff(int atOnce) {

@@ -3,6 +3,7 @@
 #define MOVIECONV_HOST_PIECES_CREW_H
 
 #include "host/convert/Bell.h"
+#include "host/convert/Ending.h"
 #include "host/convert/Job.h"
 #include "host/convert/Outlet.h"
 #include "host/convert/SpeedMeter.h"
@@ -10,9 +11,7 @@
 #include "host/convert/WorkClock.h"
 
 #include <atomic>
-#include <condition_variable>
 #include <memory>
-#include <mutex>
 #include <optional>
 #include <string>
 #include <thread>
@@ -104,10 +103,7 @@ private:
     std::atomic<bool> pause_{false};
     Bell bell_; // there is something new
 
-    mutable std::mutex mutex_; // guards these
-    std::condition_variable end_;
-    bool ended_ = false;
-    Verdict verdict_;
+    Ending ending_;
 
     // The crew's own thread's.
     std::vector<std::unique_ptr<Hand>> hands_;
