@@ -1,19 +1,15 @@
 #include "writer/Muxer.h"
 
-#include "media/FourCC.h"
-#include "media/MediaRecords.h"
 #include "thread/Stall.h"
 #include "writer/MatroskaLanguages.h"
 #include "writer/WriterFailure.h"
 #include "writer/WriterStatus.h"
 
 extern "C" {
-#include <libavutil/avstring.h>
 #include <libavutil/opt.h>
 }
 
 #include <algorithm>
-#include <cstring>
 #include <iterator>
 #include <new>
 #include <string>
@@ -54,33 +50,6 @@ void SetOption(AVFormatContext& output, const char* name, const std::string& val
     av::CheckMemory(av_opt_set(&output, name, value.c_str(), AV_OPT_SEARCH_CHILDREN));
 }
 
-void SetTags(AVDictionary*& metadata, const Tags& tags) {
-    for (const auto& [key, value] : tags)
-        av::CheckMemory(av_dict_set(&metadata, key.c_str(), value.c_str(), 0));
-}
-
-/// What the container can hold. Vorbis comments have one name for both the comment and the description: what
-/// would be lost goes into one text.
-Tags TagsFor(const Container& container, Tags tags) {
-    constexpr uint32_t kFlac = FourCC("FLAC");
-    constexpr uint32_t kOgg = FourCC("OGG ");
-    for (auto tag = tags.begin(); tag != tags.end();)
-        tag = CarriesTag(container, tag->first, tag->second) ? std::next(tag) : tags.erase(tag);
-    const auto find = [&](const char* key) {
-        return std::find_if(tags.begin(), tags.end(),
-                            [&](const auto& tag) { return av_strcasecmp(tag.first.c_str(), key) == 0; });
-    };
-    const auto comment = find("comment");
-    const auto description = find("description");
-    if ((container.code != kFlac && container.code != kOgg) || comment == tags.end() ||
-        description == tags.end())
-        return tags;
-    if (comment->second != description->second)
-        description->second += "\n" + comment->second;
-    tags.erase(comment);
-    return tags;
-}
-
 void SetFragments(AVFormatContext& output, bool describedByPacket, int64_t room) {
     // Times are written as they are, from the first fragment on.
     std::string flags = "empty_moov+default_base_moof+frag_discont";
@@ -102,7 +71,11 @@ void SetFragments(AVFormatContext& output, bool describedByPacket, int64_t room)
 } // namespace
 
 Muxer::Muxer(const Container& container, AvioFile& file, bool fragmented, bool bitExact, const Extras& extras)
-    : container_(container), file_(file), fragmented_(fragmented), extras_(extras), packet_(av::NewPacket()) {
+    : container_(container),
+      file_(file),
+      fragmented_(fragmented),
+      extras_(container, fragmented, extras),
+      packet_(av::NewPacket()) {
     AVFormatContext* output = nullptr;
     const int error = avformat_alloc_output_context2(&output, nullptr, container.muxer, nullptr);
     output_.reset(output);
@@ -111,8 +84,7 @@ Muxer::Muxer(const Container& container, AvioFile& file, bool fragmented, bool b
     output_->flags |= AVFMT_FLAG_CUSTOM_IO;
     if (bitExact)
         output_->flags |= AVFMT_FLAG_BITEXACT;
-    if (Carries(kWriterFormatTags))
-        SetTags(output_->metadata, TagsFor(container, extras.tags));
+    extras_.SetMovieTags(*output_);
 }
 
 int Muxer::AddStream(const MuxedStream& stream) {
@@ -120,15 +92,7 @@ int Muxer::AddStream(const MuxedStream& stream) {
     if (made == nullptr)
         throw std::bad_alloc();
     Check(avcodec_parameters_copy(made->codecpar, stream.parameters), "does not take a stream");
-    if (Carries(kWriterFormatTags)) {
-        Tags tags = stream.label->tags;
-        if (tags.erase("language_tag") != 0 && IsMatroska())
-            tags["language"] = LanguagePlace(*stream.label);
-        SetTags(made->metadata, tags);
-        if (container_.tagsInStream)
-            SetTags(made->metadata, TagsFor(container_, extras_.tags));
-    }
-    made->disposition = stream.label->flags;
+    extras_.SetLabel(*made, *stream.label);
     made->codecpar->codec_tag = stream.carriage->tag;
     made->time_base = stream.unit;
     made->avg_frame_rate = stream.rate;
@@ -142,20 +106,13 @@ int Muxer::AddStream(const MuxedStream& stream) {
 
 void Muxer::WriteHeader(int64_t room) {
     SetOptions(room);
-    if (Carries(kWriterFormatAttachments))
-        AddAttachments();
-    if (Carries(kWriterFormatCover) && !fragmented_)
-        AddCover();
+    extras_.AddStreams(*output_);
     Check(avformat_write_header(output_.get(), nullptr), "refuses its header");
-    WriteCover();
+    Check(extras_.WriteCover(*output_), "refuses its cover");
     SetLanguageTags();
     NoteWhole();
     if (fragmented_)
         SetDelays();
-}
-
-bool Muxer::IsMatroska() const {
-    return std::strcmp(container_.muxer, "matroska") == 0 || std::strcmp(container_.muxer, "webm") == 0;
 }
 
 /// The multiplexer writes the tracks with the header, and once more at the end.
@@ -164,7 +121,7 @@ void Muxer::SetLanguageTags() {
     for (const State& stream : streams_)
         if (!stream.label->Text("language_tag").empty())
             labels.push_back(stream.label);
-    if (labels.empty() || !IsMatroska() || file_.Flush() != 0)
+    if (labels.empty() || !extras_.IsMatroska() || file_.Flush() != 0)
         return;
     if (const int error = PutLanguageTags(*file_.File(), labels); error != 0)
         throw SystemFailure(kWriterErrorWrite, error, "The languages could not be written");
@@ -185,75 +142,8 @@ void Muxer::SetOptions(int64_t room) {
     }
 }
 
-void Muxer::AddAttachments() {
-    const auto add = [this](const std::string& name, const std::string& mimeType, const Bytes& data) {
-        AVStream* made = avformat_new_stream(output_.get(), nullptr);
-        if (made == nullptr)
-            throw std::bad_alloc();
-        made->codecpar->codec_type = AVMEDIA_TYPE_ATTACHMENT;
-        made->codecpar->extradata =
-            static_cast<uint8_t*>(av_mallocz(data->size() + AV_INPUT_BUFFER_PADDING_SIZE));
-        if (made->codecpar->extradata == nullptr)
-            throw std::bad_alloc();
-        std::copy(data->begin(), data->end(), made->codecpar->extradata);
-        made->codecpar->extradata_size = static_cast<int>(data->size());
-        SetTags(made->metadata, {{"filename", name}, {"mimetype", mimeType}});
-    };
-    if (extras_.cover.codec == AV_CODEC_ID_PNG)
-        add("cover.png", "image/png", extras_.cover.data);
-    else if (extras_.cover.codec == AV_CODEC_ID_MJPEG)
-        add("cover.jpg", "image/jpeg", extras_.cover.data);
-    for (const Attachment& attachment : extras_.attachments)
-        add(attachment.fileName, attachment.mimeType, attachment.data);
-}
-
-/// As a stream of one picture, for containers without attachments.
-void Muxer::AddCover() {
-    if (extras_.cover.codec == AV_CODEC_ID_NONE || Carries(kWriterFormatAttachments))
-        return;
-    AVStream* made = avformat_new_stream(output_.get(), nullptr);
-    if (made == nullptr)
-        throw std::bad_alloc();
-    made->codecpar->codec_type = AVMEDIA_TYPE_VIDEO;
-    made->codecpar->codec_id = extras_.cover.codec;
-    made->codecpar->width = extras_.cover.width;
-    made->codecpar->height = extras_.cover.height;
-    made->disposition = AV_DISPOSITION_ATTACHED_PIC;
-    SetTags(made->metadata, {{"comment", "Cover (front)"}}); // what kind of picture it is
-    made->time_base = {1, 90000};
-    coverStream_ = made->index;
-}
-
-void Muxer::WriteCover() {
-    if (coverStream_ < 0)
-        return;
-    const std::vector<uint8_t>& data = *extras_.cover.data;
-    const av::Packet cover = av::NewPacket();
-    av::CheckMemory(av_new_packet(cover.get(), static_cast<int>(data.size())));
-    std::copy(data.begin(), data.end(), cover->data);
-    cover->stream_index = coverStream_;
-    cover->pts = cover->dts = 0;
-    cover->flags |= AV_PKT_FLAG_KEY;
-    Check(av_write_frame(output_.get(), cover.get()), "refuses its cover");
-}
-
 void Muxer::SetChapters(const std::vector<Chapter>& chapters) {
-    if (!Carries(kWriterFormatChapters) || fragmented_ || chapters.empty())
-        return;
-    output_->chapters = static_cast<AVChapter**>(av_calloc(chapters.size(), sizeof(AVChapter*)));
-    if (output_->chapters == nullptr)
-        throw std::bad_alloc();
-    for (const Chapter& chapter : chapters) {
-        auto* made = static_cast<AVChapter*>(av_mallocz(sizeof(AVChapter)));
-        if (made == nullptr)
-            throw std::bad_alloc();
-        output_->chapters[output_->nb_chapters++] = made;
-        made->id = output_->nb_chapters;
-        made->time_base = {1, kTicksPerSecond};
-        made->start = chapter.begin;
-        made->end = chapter.end;
-        SetTags(made->metadata, {{"title", chapter.title}});
-    }
+    extras_.SetChapters(*output_, chapters);
 }
 
 /// The right to use the multiplexer, which may write to the file for long.
@@ -302,7 +192,7 @@ void Muxer::Write(AVPacket& packet, int stream) {
     output_->max_interleave_delta = MostApart(packet_->size);
     // A cover never gets a second packet, for which the multiplexer would wait.
     const int counted = IsEmptyText(*packet_, *out) ? 0 : 1;
-    const bool alone = coverStream_ >= 0 && streams_.size() == 1;
+    const bool alone = extras_.HasCoverStream() && streams_.size() == 1;
     Check(alone ? av_write_frame(output_.get(), packet_.get())
                 : av_interleaved_write_frame(output_.get(), packet_.get()),
           "refuses a packet");

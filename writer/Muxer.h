@@ -5,6 +5,7 @@
 #include "ffmpeg/AvHandles.h"
 #include "writer/AvioFile.h"
 #include "writer/Extras.h"
+#include "writer/ExtrasMuxer.h"
 #include "writer/FormatTable.h"
 #include "writer/HdrLight.h"
 #include "writer/PacketWriter.h"
@@ -85,23 +86,17 @@ private:
     static void NoteTimes(State& state, const AVPacket& packet);
     void Check(int result, const char* what) const;
     void SetOptions(int64_t room);
-    bool Carries(uint32_t what) const { return (container_.carries & what) != 0; }
-    void AddAttachments();
-    void AddCover();
-    void WriteCover();
     void SetDelays();
     int64_t MostApart(int packetSize);
     int64_t LeastLag() const;
     void NoteWhole();
     void FlushNowAndThen(int64_t time);
-    bool IsMatroska() const;
     void SetLanguageTags();
 
     const Container& container_;
     AvioFile& file_;
     const bool fragmented_;
-    const Extras& extras_;
-    int coverStream_ = -1;
+    ExtrasMuxer extras_;
     av::Output output_;
     av::Packet packet_;
     // Whether one has its Turn, which guards everything once the header is written.
