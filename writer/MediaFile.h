@@ -82,8 +82,8 @@ private:
     int pictureStream_ = -1;
     int soundStream_ = -1;
     StampNormaliser stamps_;
-    std::vector<SoundBlock>
-        waiting_; ///< Sound whose place is not known yet, or too short a stretch to hand on.
+    /// Sound whose place is not known yet, or too short a stretch to hand on.
+    std::vector<SoundBlock> waiting_;
     bool soundStarted_ = false;
     bool refusedPictures_ = false; ///< Some made no sense.
     bool refusedSound_ = false;

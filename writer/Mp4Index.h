@@ -58,8 +58,8 @@ private:
         int64_t delay;
         AVCodecID codec;
         bool describedByPacket;
-        std::vector<uint8_t>
-            start; ///< Of the first packet, where every one is looked at: the others begin like it.
+        /// Of the first packet, where every one is looked at: the others begin like it.
+        std::vector<uint8_t> start;
         int64_t packets = 0;
         AVRational muxedUnit{0, 1};
     };

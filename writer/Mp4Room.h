@@ -1,10 +1,9 @@
 // Room in front of a growing file of the MP4 family, in which its index comes when it is finished. F is the
 // end of the first box, R the size of the room:
 //
-//     growing     [ftyp][free R                                              ][moov][moof mdat][moof mdat]...
-//     finished    [ftyp][free 16][index][free, the rest][mdat, to the end: texts, moov, moof mdat, moof
-//     mdat...] too small   [ftyp][free 16][mdat: rest of the room, moov, moof mdat..., head of a free box,
-//     texts][index]
+//     growing     [ftyp][free R                       ][moov][moof mdat]...
+//     finished    [ftyp][free 16][index][free, the rest][mdat to the end: texts, moov, moof mdat...]
+//     too small   [ftyp][free 16][mdat: rest of the room, moov, moof mdat..., free box, texts][index]
 //
 // Everything is written where a reader of the growing file skips it, and reaches the disk, before the size of
 // the room becomes 16. R is chosen so that this changes one byte: a file is either the one or the other,

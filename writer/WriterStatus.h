@@ -15,8 +15,7 @@
 /// parameters name no set share kWriterDefaultSet.
 ///
 /// Records begin with their size, so that they can grow; in C, the caller fills it in. All functions may be
-/// called on any thread. Texts are UTF-8; bytes of a file name that are not UTF-8 stand
-/// as they are.
+/// called on any thread. Texts are UTF-8; bytes of a file name that are not UTF-8 stand as they are.
 #ifndef MOVIECONV_WRITER_WRITERSTATUS_H
 #define MOVIECONV_WRITER_WRITERSTATUS_H
 
@@ -288,10 +287,10 @@ typedef struct WriterTrackItem {
 
 /// Asks the host for the next item of a track, which begins before `until` in the source. 0 when there is
 /// none at hand: it is asked again when the file has come further; `item->llTime` is then where the next one
-/// begins at the earliest. For `closing` the file ends there, and the
-/// host waits for its source until it is sure; it may know better than `until` where that end is. Items come
-/// in their order, sound without gaps, and stay valid until the next call. Called on one thread of the
-/// writer's at a time, for one file after the other.
+/// begins at the earliest. For `closing` the file ends there, and the host waits for its source until it is
+/// sure; it may know better than `until` where that end is. Items come in their order, sound without gaps,
+/// and stay valid until the next call. Called on one thread of the writer's at a time, for one file after the
+/// other.
 typedef int (*WriterTrackReader)(void* context, int64_t until, int closing, WriterTrackItem* item);
 
 /// A track beside the engine's pictures and sound. Its source is asked, as the file grows, for what belongs

@@ -54,8 +54,8 @@ public:
     /// before ReadBeside.
     void SetBounds(double begin, bool ends, bool isCut);
 
-    /// Reads a stream beside those that are converted, as PCM or as its packets; the track
-    /// lives as long as the movie. Once for a stream, only before the conversion. Throws SourceError.
+    /// Reads a stream beside those that are converted, as PCM or as its packets; the track lives as long as
+    /// the movie. Once for a stream, only before the conversion. Throws SourceError.
     BesideSound& ReadSoundBeside(int stream);
     BesidePackets& ReadPacketsBeside(int stream);
 
@@ -92,9 +92,12 @@ public:
     /// Pieces of picture data that were skipped. Once the pictures ended.
     int64_t DamagedPictures() const { return pictures_ ? pictures_->Damaged() : 0; }
 
-    /// Pictures without a stamp, where only stamps are read, and jumps of the clock. Once the pictures ended.
-    bool StampIsRepaired() const { return stamps_ && stamps_->IsRepaired(); } // of the current picture
+    /// Where only stamps are read: whether the current picture's was put right, and how many pictures had
+    /// none, once they ended.
+    bool StampIsRepaired() const { return stamps_ && stamps_->IsRepaired(); }
     int64_t UnstampedPictures() const { return stamps_ ? stamps_->Unstamped() : 0; }
+
+    /// Times that the source's clock jumped and was put right. Once the pictures ended.
     int ClockJumps() const { return demuxer_.ClockJumps(); }
 
     /// What was wrong with the movie and has been put right or skipped, a sentence each. Once both streams

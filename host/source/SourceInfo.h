@@ -54,13 +54,12 @@ struct PictureStreamInfo {
     std::string fineColours;  ///< "4:2:2", "RGB": finer than the 4:2:0 that is written; empty when not.
     int width = 0;            ///< As shown, after rotation and cropping.
     int height = 0;
-    int quarterTurns = 0;  ///< Clockwise turns by 90 degrees that bring the stored picture upright.
-    bool mirrored = false; ///< The stored picture is mirrored left to right before it is turned.
-    AVRational
-        pixelAspect{};    ///< Shape of a pixel as shown, width to height; 1:1 when the source does not tell.
-    double frameRate = 0; ///< Average pictures per second; 0 when the container tells none.
-    double peakRate = 0;  ///< Pictures per second where they follow each other closest; at least the average.
-    double duration = 0;  ///< Seconds; estimated when the container does not tell.
+    int quarterTurns = 0;     ///< Clockwise turns by 90 degrees that bring the stored picture upright.
+    bool mirrored = false;    ///< The stored picture is mirrored left to right before it is turned.
+    AVRational pixelAspect{}; ///< Of a pixel as shown, width to height; 1:1 when the source does not tell.
+    double frameRate = 0;     ///< Average pictures per second; 0 when the container tells none.
+    double peakRate = 0; ///< Pictures per second where they follow each other closest; at least the average.
+    double duration = 0; ///< Seconds; estimated when the container does not tell.
     bool interlaced = false;
     bool topFieldFirst = false;
     bool fullRange = false;

@@ -26,9 +26,13 @@ namespace recorder {
 struct Recording {
     /// Lines as
     ///
-    ///     create NAME WxH@RATE RATE/CHANNELS -> #FILE     formats that are null are "-", a failure is "->
-    ///     null" sound #FILE STAMP +BYTES                        "silence" for the engine's own, which is all
-    ///     zeros picture #FILE STAMP close #FILE, or close #FILE with callback
+    ///     create NAME WxH@RATE RATE/CHANNELS -> #FILE
+    ///     sound #FILE STAMP +BYTES
+    ///     picture #FILE STAMP
+    ///     close #FILE, or close #FILE with callback
+    ///
+    /// where formats that are null are "-", a failed create ends in "-> null", and sound of zeros alone, the
+    /// engine's own, is called "silence".
     std::vector<std::string> trace;
 
     std::vector<AudioFrame> sounds;   ///< The records of the writes.
