@@ -98,9 +98,4 @@ TEST(StereoTest, WidensAndDoubles) {
     }
 }
 
-TEST(PlayAudioTest, GivesTheDescription) {
-    Blocks decoder;
-    EXPECT_EQ(PlayAudio(&decoder), decoder.GetAudioInfo());
-}
-
 } // namespace

@@ -5,9 +5,31 @@
 #include <gtest/gtest.h>
 
 #include <atomic>
+#include <chrono>
 #include <string_view>
 #include <thread>
 #include <utility>
+
+#include <unistd.h>
+
+namespace {
+
+std::atomic<int> g_naps{0}; // that were begun
+
+/// Waits until the count has grown.
+void AwaitOneMore(std::atomic<int>& count) {
+    count.wait(count);
+}
+
+} // namespace
+
+// Takes the place of the system's, in the engine too.
+extern "C" __attribute__((visibility("default"))) int usleep(useconds_t microseconds) {
+    ++g_naps;
+    g_naps.notify_all();
+    std::this_thread::sleep_for(std::chrono::microseconds(microseconds));
+    return 0;
+}
 
 namespace {
 
@@ -19,22 +41,23 @@ protected:
 
     /// Counts the pictures written, and forgets what is recorded of them.
     void Count() {
-        recorder::Reset({.onWrite = [&] { ++pictures; }});
+        recorder::Reset({.onWrite = [&] {
+            ++pictures;
+            pictures.notify_all();
+        }});
     }
 
-    /// Waits until the worker stands still.
+    /// Waits until the worker has sat out a part of a pause, in which it naps, without moving on.
     void AwaitStandstill() {
         for (int before = -1; before != pictures;) {
             before = pictures;
-            std::this_thread::sleep_for(std::chrono::milliseconds(30));
+            AwaitOneMore(g_naps);
+            AwaitOneMore(g_naps);
         }
     }
 
     /// Waits until the worker has moved on.
-    void AwaitProgress() {
-        for (const int before = pictures; pictures == before;)
-            std::this_thread::sleep_for(std::chrono::milliseconds(1));
-    }
+    void AwaitProgress() { AwaitOneMore(pictures); }
 
     IdleVideo video{kEndless};
     std::atomic<int> pictures{0};
