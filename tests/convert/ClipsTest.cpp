@@ -17,7 +17,6 @@ using namespace inspect;
 
 constexpr double kSeconds = 12;
 constexpr double kTick = 1e-4; // stamps in a Matroska file count milliseconds
-const Args kPlain{"-c:v", "mpeg4", "-q:v", "2", "-c:a", "pcm_s16le"};
 const Args kUneven{"-vf", "select='lt(mod(n,7),3)+eq(mod(n,31),5)'", "-fps_mode", "vfr"};
 
 struct Source {
@@ -87,7 +86,7 @@ TEST_P(Clips, BeginAtMultiplesOfTheirLength) {
 }
 
 Args At(const std::string& rate, double soundSeconds = kSeconds) {
-    return Join(CountedPictures(kSeconds, rate), Beeps(soundSeconds), kPlain);
+    return Join(CountedPictures(kSeconds, rate), Beeps(soundSeconds), NearLossless());
 }
 
 INSTANTIATE_TEST_SUITE_P(
@@ -97,6 +96,7 @@ INSTANTIATE_TEST_SUITE_P(
                     Source{"29.mkv", At("30000/1001"), 0.5}, Source{"23.mkv", At("24000/1001"), 2},
                     Source{"uneven.mkv", Join(At("25"), kUneven), 1},
                     Source{"short-sound.mkv", At("25", 5), 2, 0, 5},
-                    Source{"silent.mkv", Join(CountedPictures(kSeconds, "30000/1001"), kPlain), 2, 0, 0}));
+                    Source{"silent.mkv", Join(CountedPictures(kSeconds, "30000/1001"), NearLossless()), 2, 0,
+                           0}));
 
 } // namespace

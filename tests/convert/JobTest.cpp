@@ -23,15 +23,6 @@ using namespace movieconv;
 using namespace test_movies;
 using namespace inspect;
 
-std::string Short() {
-    return Make("job-short.mkv",
-                Join(CountedPictures(4), Beeps(4), Args{"-c:v", "mpeg4", "-c:a", "pcm_s16le"}));
-}
-std::string Minute() {
-    return Make("job-minute.mkv",
-                Join(CountedPictures(60), Beeps(60), Args{"-c:v", "mpeg4", "-c:a", "pcm_s16le"}));
-}
-
 Request Converting(const std::string& input, const std::string& output) {
     Request request;
     request.input = input;
@@ -54,7 +45,7 @@ TEST(Job, TellsEverythingOnTheObserversThread) {
         posted.notify_one();
     };
     Listener listener;
-    Request request = Converting(Short(), folder / "out.mp4");
+    Request request = Converting(CountedMovie(), folder / "out.mp4");
     request.preview = std::chrono::milliseconds(0);
     Job job(request, listener, loop);
     job.Start();
@@ -86,20 +77,20 @@ TEST(Job, RefusesWithACategory) {
     const Folder folder;
     WriteFile(folder / "there.mp4", "precious");
     WriteFile(folder / "text.mkv", "words");
-    Request begin = Converting(Short(), folder / "o.mp4");
+    Request begin = Converting(CountedMovie(), folder / "o.mp4");
     begin.begin = 9;
-    Request codec = Converting(Short(), folder / "o.webm");
+    Request codec = Converting(CountedMovie(), folder / "o.webm");
     codec.videoCodec = FourCC("XVID");
-    Request split = Converting(Short(), folder / "o.mp3");
+    Request split = Converting(CountedMovie(), folder / "o.mp3");
     split.split = 1;
     const struct {
         Request request;
         Category category;
         Reason reason;
     } cases[] = {
-        {Converting(Short(), folder / "there.mp4"), Category::kOutput, Reason::kExists},
-        {Converting(Short(), folder / "nowhere/o.mp4"), Category::kOutput, Reason::kOther},
-        {Converting(Short(), folder / "o.xyz"), Category::kRequest, Reason::kNoFormat},
+        {Converting(CountedMovie(), folder / "there.mp4"), Category::kOutput, Reason::kExists},
+        {Converting(CountedMovie(), folder / "nowhere/o.mp4"), Category::kOutput, Reason::kOther},
+        {Converting(CountedMovie(), folder / "o.xyz"), Category::kRequest, Reason::kNoFormat},
         {Converting(folder / "text.mkv", folder / "o.mp4"), Category::kSource, Reason::kOther},
         {Converting(folder / "none.mkv", folder / "o.mp4"), Category::kSource, Reason::kOther},
         {begin, Category::kRequest, Reason::kBeginTooLate},
@@ -123,7 +114,7 @@ TEST(Job, RefusesWithACategory) {
 TEST(Job, PausesAndStops) {
     const Folder folder;
     Listener listener;
-    Request request = Converting(Minute(), folder / "out.mp4");
+    Request request = Converting(CountedMovie(60), folder / "out.mp4");
     Job job(request, listener);
     bool pausedOnce = false;
     listener.onProgress = [&](const Progress& news) {
@@ -171,8 +162,8 @@ TEST(Job, StopsWhileItsSourceIsOpened) {
 }
 
 TEST(Job, LosesNoSoundHoweverShort) {
-    const Args oneSample{"-f", "lavfi", "-i", "aevalsrc=0.5,atrim=end_sample=1"};
-    const Args picture{"-f", "lavfi", "-i", "color=size=64x48:rate=25:duration=0.04", "-c:a", "pcm_s16le"};
+    const Args oneSample = Lavfi("aevalsrc=0.5,atrim=end_sample=1");
+    const Args picture = Join(Lavfi("color=size=64x48:rate=25:duration=0.04"), Words("-c:a pcm_s16le"));
     for (const std::string& source :
          {Make("one-sample.wav", oneSample), Make("one-sample.mov", Join(oneSample, picture))}) {
         const Folder folder;
@@ -207,7 +198,7 @@ TEST(Job, IsNoSuccessWhenItsFileVanishes) {
                 }
             };
             const Verdict verdict =
-                Convert(Converting(Minute(), folder / "out/movie." + extension), listener);
+                Convert(Converting(CountedMovie(60), folder / "out/movie." + extension), listener);
             EXPECT_EQ(verdict.outcome, Outcome::kFailed);
             ASSERT_TRUE(verdict.failure);
             EXPECT_EQ(verdict.failure->Kind(), Category::kOutput);
@@ -228,7 +219,7 @@ TEST(Job, IsNoSuccessWhenAClipVanishesOrIsAnother) {
             if (replaced)
                 WriteFile(folder / "movie_01.mkv", "precious");
         };
-        Request request = Converting(Short(), folder / "movie.mkv");
+        Request request = Converting(CountedMovie(), folder / "movie.mkv");
         request.split = 1;
         const Verdict verdict = Convert(request, listener);
         EXPECT_EQ(listener.closed.size(), 4u);
@@ -249,7 +240,7 @@ TEST(Job, WaitsForAsMuchRoomAsItNeeds) {
         if (news.phase == Phase::kWaitingForRoom)
             fs::remove(folder / "disk/ballast");
     };
-    Request request = Converting(Short(), folder / "disk/out.mkv");
+    Request request = Converting(CountedMovie(), folder / "disk/out.mkv");
     request.audioCodec = FourCC("PCM ");
     request.length = 3;
     request.onFull = OnFull::kWait;

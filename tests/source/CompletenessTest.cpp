@@ -83,10 +83,9 @@ TEST(Sources, ThatAreCutOffSaySo) {
 }
 
 TEST(Sources, AreWholeWhenOnlyAnotherStreamPromisesMore) {
-    const Folder folder;
-    WriteFile(folder / "late.srt", "1\n00:00:01,000 --> 00:00:30,000\nWords\n");
-    const Args inputs = Join(CountedPictures(2), Beeps(6), Args{"-i", folder / "late.srt"});
-    const Args codecs{"-map", "0", "-map", "1", "-map", "2", "-c:v", "mpeg4", "-c:a", "aac"};
+    const std::string late = Part("late.srt", "1\n00:00:01,000 --> 00:00:30,000\nWords\n");
+    const Args inputs = Join(CountedPictures(2), Beeps(6), Args{"-i", late});
+    const Args codecs = Words("-map 0 -map 1 -map 2 -c:v mpeg4 -c:a aac");
     for (const auto& [name, subtitles] :
          {std::pair{"more-subtitles.mkv", "srt"}, {"more-subtitles.mp4", "mov_text"}}) {
         const std::string path = Make(name, Join(inputs, codecs, Args{"-c:s", subtitles}));

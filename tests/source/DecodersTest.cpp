@@ -34,8 +34,7 @@ std::string CountedTs() {
     return Make("counted.ts", Join(CountedPictures(4), Beeps(4), H264Aac(), Args{"-c:a", "mp2"}));
 }
 std::string CountedMkv() {
-    return Make("counted.mkv", Join(CountedPictures(4), Beeps(4),
-                                    Args{"-c:v", "mpeg4", "-q:v", "2", "-g", "30", "-c:a", "pcm_s16le"}));
+    return Make("counted.mkv", Join(CountedPictures(4), Beeps(4), NearLossless(), Words("-g 30")));
 }
 std::string CountedMpeg4Ts() {
     return Make("counted-mpeg4.ts",
@@ -168,8 +167,8 @@ TEST(Decoders, KeepTheFormOfSoundThatChangesOnTheWay) {
 }
 
 TEST(Decoders, FillTheTimeBeforeLateSound) {
-    const std::string path = Make("late.mov", Join(CountedPictures(4), Args{"-itsoffset", "1.3"}, Beeps(2),
-                                                   Args{"-c:v", "mpeg4", "-q:v", "2", "-c:a", "pcm_s16le"}));
+    const std::string path =
+        Make("late.mov", Join(CountedPictures(4), Args{"-itsoffset", "1.3"}, Beeps(2), NearLossless()));
     Movie movie(path, {});
     EXPECT_NEAR(movie.Info().sound->duration, 3.3, 0.01);
     const Seen seen = TakeAll(movie);
@@ -182,8 +181,8 @@ TEST(Decoders, FillTheTimeBeforeLateSound) {
 }
 
 TEST(Decoders, HoldTheFirstPictureWhenSoundBeginsFirst) {
-    const std::string path = Make("early.mkv", Join(Args{"-itsoffset", "0.72"}, CountedPictures(2), Beeps(3),
-                                                    Args{"-c:v", "mpeg4", "-q:v", "2", "-c:a", "pcm_s16le"}));
+    const std::string path =
+        Make("early.mkv", Join(Args{"-itsoffset", "0.72"}, CountedPictures(2), Beeps(3), NearLossless()));
     const Seen seen = LookAt(path);
     ASSERT_EQ(seen.pictures.size(), 50u);
     EXPECT_EQ(seen.pictures[0].time, 0);

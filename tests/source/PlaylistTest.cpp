@@ -1,7 +1,6 @@
 // What a source may make the program read besides itself.
 #include "host/source/Source.h"
 #include "tests/support/Inspect.h"
-#include "tests/support/Program.h"
 #include "tests/support/TestMovies.h"
 
 #include <gtest/gtest.h>
@@ -112,21 +111,9 @@ INSTANTIATE_TEST_SUITE_P(Lists, Playlists, testing::ValuesIn(kLists),
 
 TEST(Playlist, OfFragmentsIsReadFromAnyTimeOn) { // which its demultiplexer cannot seek in
     const Folder folder;
-    const Args fragments{"-c:v",
-                         "mpeg4",
-                         "-g",
-                         "10",
-                         "-f",
-                         "hls",
-                         "-hls_time",
-                         "1",
-                         "-hls_segment_type",
-                         "fmp4",
-                         "-hls_list_size",
-                         "0",
-                         folder / "list.m3u8"};
-    ASSERT_EQ(program::Run(Join(Args{"ffmpeg", "-v", "error"}, CountedPictures(4), Beeps(4), fragments)).code,
-              0);
+    Ffmpeg(Join(CountedPictures(4), Beeps(4),
+                Words("-c:v mpeg4 -g 10 -f hls -hls_time 1 -hls_segment_type fmp4 -hls_list_size 0"),
+                Args{folder / "list.m3u8"}));
     Movie movie(folder / "list.m3u8", {.playlists = true});
     const inspect::Seen seen = inspect::TakeAll(movie, 2);
     ASSERT_NEAR(static_cast<double>(seen.pictures.size()), 50, 1); // its clock begins with the sound

@@ -89,46 +89,12 @@ TEST(Source, DescribesEverythingThatItHolds) {
               "START=0\nEND=1000\ntitle=First\n[CHAPTER]\nTIMEBASE=1/1000\nSTART=1000\n"
               "END=2000\ntitle=Second\n");
     const std::string path = folder / "whole.mkv";
-    const Args inputs = Join(Args{"ffmpeg", "-v", "error"}, CountedPictures(2), Beeps(2),
-                             Args{"-i", folder / "words.srt", "-i", folder / "notes.txt"});
-    const Args outputs{"-map",
-                       "0",
-                       "-map",
-                       "1",
-                       "-map",
-                       "1",
-                       "-map",
-                       "2",
-                       "-map_metadata",
-                       "3",
-                       "-c:v",
-                       "libx264",
-                       "-pix_fmt",
-                       "yuv420p10le",
-                       "-color_primaries",
-                       "bt2020",
-                       "-color_trc",
-                       "smpte2084",
-                       "-c:a",
-                       "pcm_s24le",
-                       "-metadata:s:a:0",
-                       "language=ger",
-                       "-metadata:s:a:1",
-                       "title=Director",
-                       "-disposition:a:0",
-                       "default",
-                       "-disposition:a:1",
-                       "comment",
-                       "-c:s",
-                       "srt",
-                       "-disposition:s:0",
-                       "forced",
-                       "-attach",
-                       folder / "font.ttf",
-                       "-metadata:s:t",
-                       "mimetype=font/ttf",
-                       path};
-    ASSERT_EQ(program::Run(Join(inputs, outputs)).code, 0);
+    Ffmpeg(Join(CountedPictures(2), Beeps(2), Args{"-i", folder / "words.srt", "-i", folder / "notes.txt"},
+                Words("-map 0 -map 1 -map 1 -map 2 -map_metadata 3 -c:v libx264 -pix_fmt yuv420p10le "
+                      "-color_primaries bt2020 -color_trc smpte2084 -c:a pcm_s24le -c:s srt "
+                      "-metadata:s:a:0 language=ger -metadata:s:a:1 title=Director "
+                      "-disposition:a:0 default -disposition:a:1 comment -disposition:s:0 forced"),
+                Args{"-attach", folder / "font.ttf"}, Words("-metadata:s:t mimetype=font/ttf"), Args{path}));
     const SourceInfo info = Source(path, {}).Info();
     ASSERT_EQ(info.streams.size(), 5u);
     const StreamInfo& pictures = info.streams[0];
@@ -184,9 +150,8 @@ TEST(Source, KeepsACountedRateWhenItsLengthIsMeasured) {
 }
 
 TEST(Demuxer, DoesNotReadOnWhereSoundStaysAway) {
-    const Args raw{"-f",   "lavfi",    "-i",   "color=gray:s=320x240:r=25:d=24,format=yuv420p",
-                   "-f",   "lavfi",    "-i",   "sine=d=1:r=44100",
-                   "-c:v", "rawvideo", "-c:a", "pcm_s16le"};
+    const Args raw = Join(Lavfi("color=gray:s=320x240:r=25:d=24,format=yuv420p", "sine=d=1:r=44100"),
+                          Words("-c:v rawvideo -c:a pcm_s16le"));
     Source source(Make("sound-ends.mkv", raw), {});
     Failures failures([] {});
     Demuxer demuxer(source, failures);

@@ -12,19 +12,20 @@ namespace {
 using program::Call;
 using program::Result;
 using test_movies::Args;
+using test_movies::Ffmpeg;
 using test_movies::Join;
+using test_movies::Lavfi;
+using test_movies::Words;
 using whole_movie::Json;
 
-const Args kMovie{"-f", "lavfi", "-i", "testsrc=s=64x48:r=10:d=2", "-f", "lavfi", "-i", "sine=d=2:r=8000"};
+const Args kMovie = Lavfi("testsrc=s=64x48:r=10:d=2", "sine=d=2:r=8000");
+const Args kCodecs = Words("-c:v mpeg4 -c:a flac");
 
 /// Two seconds in Matroska with these texts of FFmpeg's form.
 std::string WithNotes(const Folder& folder, const std::string& notes) {
     WriteFile(folder / "notes.txt", ";FFMETADATA1\n" + notes);
-    const Result made =
-        program::Run(Join(Args{"ffmpeg", "-v", "error", "-y"}, kMovie,
-                          Args{"-i", folder / "notes.txt", "-map_metadata", "2", "-map_chapters", "2", "-c:v",
-                               "mpeg4", "-c:a", "flac", folder / "in.mkv"}));
-    EXPECT_EQ(made.code, 0) << made.err;
+    Ffmpeg(Join(kMovie, Args{"-i", folder / "notes.txt"}, Words("-map_metadata 2 -map_chapters 2"), kCodecs,
+                Args{folder / "in.mkv"}));
     return folder / "in.mkv";
 }
 
@@ -106,17 +107,11 @@ TEST(BrokenMovie, TextsInOldCharacterSetsAndLongOnes) {
 
 TEST(BrokenMovie, ALargeCover) {
     const Folder folder;
-    ASSERT_EQ(program::Run({"ffmpeg", "-v", "error", "-f", "lavfi", "-i", "testsrc=s=64x64", "-frames:v", "1",
-                            folder / "cover.png"})
-                  .code,
-              0);
+    Ffmpeg(Join(Lavfi("testsrc=s=64x64"), Args{"-frames:v", "1", folder / "cover.png"}));
     const std::string cover = ReadFile(folder / "cover.png") + std::string(20'000'000, 'x');
     WriteFile(folder / "cover.png", cover);
-    ASSERT_EQ(program::Run(Join(Args{"ffmpeg", "-v", "error"}, kMovie,
-                                Args{"-c:v", "mpeg4", "-c:a", "flac", "-attach", folder / "cover.png",
-                                     "-metadata:s:t", "mimetype=image/png", folder / "in.mkv"}))
-                  .code,
-              0);
+    Ffmpeg(Join(kMovie, kCodecs, Args{"-attach", folder / "cover.png"},
+                Words("-metadata:s:t mimetype=image/png"), Args{folder / "in.mkv"}));
     for (const char* name : {"out.mp4", "out.mkv", "out.m4a", "out.mp3", "out.flac"}) {
         SCOPED_TRACE(name);
         const Result made = Call({folder / "in.mkv", folder / name, "--progress", "json"});
@@ -145,12 +140,12 @@ TEST(BrokenMovie, LanguagesOfEveryKind) {
         {"xx", "xx", ""},        {"english", "english", ""},
     };
     const Folder folder;
-    Args make = Join(Args{"ffmpeg", "-v", "error"}, kMovie, Args{"-map", "0"});
+    Args make = Join(kMovie, Words("-map 0"));
     int number = 0;
     for (const auto& test : cases)
         make = Join(make, Args{"-map", "1", "-metadata:s:a:" + std::to_string(number++),
                                std::string("language=") + test.source});
-    ASSERT_EQ(program::Run(Join(make, Args{"-c:v", "mpeg4", "-c:a", "flac", folder / "in.mkv"})).code, 0);
+    Ffmpeg(Join(make, kCodecs, Args{folder / "in.mkv"}));
     for (const std::string extension : {"mkv", "mp4", "mov"}) {
         SCOPED_TRACE(extension);
         const Result made =
@@ -176,73 +171,19 @@ TEST(BrokenMovie, LanguagesOfEveryKind) {
 /// A further track that begins late and ends early, and one whose shape changes on the way.
 TEST(BrokenMovie, TracksThatChangeOnTheWay) {
     const Folder folder;
-    const auto part = [&](const char* name, const char* size, const char* layout, const char* rate) {
-        ASSERT_EQ(program::Run({"ffmpeg",
-                                "-v",
-                                "error",
-                                "-f",
-                                "lavfi",
-                                "-i",
-                                std::string("testsrc=r=25:d=2:s=") + size,
-                                "-f",
-                                "lavfi",
-                                "-i",
-                                "sine=d=2:r=48000",
-                                "-f",
-                                "lavfi",
-                                "-i",
-                                std::string("anoisesrc=d=2:a=0.3:r=") + rate,
-                                "-map",
-                                "0",
-                                "-map",
-                                "1",
-                                "-map",
-                                "2",
-                                "-c:v",
-                                "mpeg2video",
-                                "-c:a",
-                                "mp2",
-                                "-ac:a:1",
-                                layout,
-                                "-ar:a:1",
-                                rate,
-                                folder / name})
-                      .code,
-                  0);
+    const auto part = [&](const char* name, const std::string& size, const std::string& channels,
+                          const std::string& rate) {
+        Ffmpeg(Join(
+            Lavfi("testsrc=r=25:d=2:s=" + size, "sine=d=2:r=48000", "anoisesrc=d=2:a=0.3:r=" + rate),
+            Words("-map 0 -map 1 -map 2 -c:v mpeg2video -c:a mp2 -ac:a:1 " + channels + " -ar:a:1 " + rate),
+            Args{folder / name}));
     };
     part("a.ts", "160x120", "1", "48000");
     part("b.ts", "128x96", "2", "32000");
     WriteFile(folder / "both.ts", ReadFile(folder / "a.ts") + ReadFile(folder / "b.ts"));
-    ASSERT_EQ(program::Run({"ffmpeg",
-                            "-v",
-                            "error",
-                            "-f",
-                            "lavfi",
-                            "-i",
-                            "testsrc=s=64x48:r=10:d=4",
-                            "-f",
-                            "lavfi",
-                            "-i",
-                            "sine=d=4:r=48000",
-                            "-f",
-                            "lavfi",
-                            "-itsoffset",
-                            "1.5",
-                            "-i",
-                            "sine=d=1:r=48000",
-                            "-map",
-                            "0",
-                            "-map",
-                            "1",
-                            "-map",
-                            "2",
-                            "-c:v",
-                            "mpeg4",
-                            "-c:a",
-                            "flac",
-                            folder / "short.mkv"})
-                  .code,
-              0);
+    Ffmpeg(Join(Lavfi("testsrc=s=64x48:r=10:d=4", "sine=d=4:r=48000"), Words("-itsoffset 1.5"),
+                Lavfi("sine=d=1:r=48000"), Words("-map 0 -map 1 -map 2"), kCodecs,
+                Args{folder / "short.mkv"}));
     for (const char* source : {"both.ts", "short.mkv"})
         for (const char* name : {"out.mp4", "out.mkv"}) {
             SCOPED_TRACE(std::string(source) + name);
@@ -250,11 +191,10 @@ TEST(BrokenMovie, TracksThatChangeOnTheWay) {
             ASSERT_EQ(made.code, 0) << made.err;
             const Json probe = whole_movie::Probe(folder / name);
             EXPECT_NEAR(std::stod(probe["format"]["duration"].get<std::string>()), 4, 0.2);
-            const Result sound = program::Run({"ffmpeg", "-v", "error", "-i", folder / name, "-map", "0:a:1",
-                                               "-ac", "1", "-ar", "8000", "-f", "s16le", "-"});
-            EXPECT_EQ(sound.err, "");
+            const std::string sound =
+                test_movies::FfmpegReads(folder / name, Words("-map 0:a:1 -ac 1 -ar 8000 -f s16le"));
             const bool isShort = std::string(source) == "short.mkv";
-            EXPECT_NEAR(static_cast<double>(sound.out.size()) / 16000, isShort ? 2.5 : 4, 0.2);
+            EXPECT_NEAR(static_cast<double>(sound.size()) / 16000, isShort ? 2.5 : 4, 0.2);
         }
 }
 

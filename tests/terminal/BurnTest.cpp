@@ -13,7 +13,11 @@ namespace {
 using program::Call;
 using program::Result;
 using test_movies::Args;
+using test_movies::Ffmpeg;
+using test_movies::FfmpegReads;
 using test_movies::Join;
+using test_movies::Lavfi;
+using test_movies::Words;
 
 /// What is bright in a picture; empty where nothing is.
 struct Box {
@@ -37,9 +41,7 @@ Box BrightPart(const unsigned char* picture, int width, int height) {
 
 /// Of every picture of a movie of that size.
 std::vector<Box> BoxesOf(const std::string& path, int width, int height) {
-    const std::string rows = program::Run({"ffmpeg", "-v", "error", "-i", path, "-map", "0:v:0", "-f",
-                                           "rawvideo", "-pix_fmt", "gray", "-"})
-                                 .out;
+    const std::string rows = FfmpegReads(path, Words("-map 0:v:0 -f rawvideo -pix_fmt gray"));
     const auto size = static_cast<size_t>(width * height);
     EXPECT_EQ(rows.size() % size, 0);
     std::vector<Box> boxes;
@@ -155,16 +157,9 @@ TEST(Burn, TakesFilesAndTheFontsOfTheSource) {
         "Format: Layer, Start, End, Style, Name, MarginL, MarginR, MarginV, Effect, Text\n"
         "Dialogue: 0,0:00:00.00,0:00:01.00,Default,,0,0,0,,iiiiii\n");
     const auto width = [&](bool attached) {
-        Args make{"ffmpeg", "-v",
-                  "error",  "-y",
-                  "-f",     "lavfi",
-                  "-i",     "color=black:s=160x120:r=10:d=1",
-                  "-i",     folder / "own.ass",
-                  "-c:s",   "copy",
-                  "-c:v",   "ffv1"};
-        if (attached)
-            make = Join(make, Args{"-attach", folder / "own.ttf", "-metadata:s:t", "mimetype=font/ttf"});
-        EXPECT_EQ(program::Run(Join(make, Args{folder / "font.mkv"})).code, 0);
+        const Args font{"-attach", folder / "own.ttf", "-metadata:s:t", "mimetype=font/ttf"};
+        Ffmpeg(Join(Lavfi("color=black:s=160x120:r=10:d=1"), Args{"-i", folder / "own.ass"},
+                    Words("-c:s copy -c:v ffv1"), attached ? font : Args{}, Args{folder / "font.mkv"}));
         const Result made = Call({folder / "font.mkv", folder / "out.mkv", "--burn-subtitles", "1",
                                   "--video-codec", "FFV1", "-y", "-q"});
         EXPECT_EQ(made.code, 0) << made.err;

@@ -14,7 +14,9 @@ using program::Result;
 using test_movies::Args;
 using test_movies::Beeps;
 using test_movies::CountedPictures;
+using test_movies::Ffmpeg;
 using test_movies::Join;
+using test_movies::Words;
 
 /// Two seconds with texts, two chapters, subtitles, a cover and a font.
 std::string MakeWhole(const Folder& folder) {
@@ -23,46 +25,20 @@ std::string MakeWhole(const Folder& folder) {
     WriteFile(folder / "notes.txt", ";FFMETADATA1\ntitle=The whole\nartist=Nobody\n"
                                     "[CHAPTER]\nTIMEBASE=1/1000\nSTART=0\nEND=1000\ntitle=First\n"
                                     "[CHAPTER]\nTIMEBASE=1/1000\nSTART=1000\nEND=2000\ntitle=Second\n");
-    EXPECT_EQ(program::Run(Join(Args{"ffmpeg", "-v", "error"}, CountedPictures(2),
-                                Args{"-frames:v", "1", folder / "cover.png"}))
-                  .code,
-              0);
+    Ffmpeg(Join(CountedPictures(2), Args{"-frames:v", "1", folder / "cover.png"}));
     const std::string path = folder / "whole.mkv";
-    const Args parts{"-i",
-                     folder / "words.srt",
-                     "-i",
-                     folder / "notes.txt",
-                     "-map",
-                     "0",
-                     "-map",
-                     "1",
-                     "-map",
-                     "2",
-                     "-map_metadata",
-                     "3",
-                     "-c:s",
-                     "srt",
-                     "-metadata:s",
-                     "language=ger",
-                     "-attach",
-                     folder / "cover.png",
-                     "-attach",
-                     folder / "font.ttf",
-                     "-metadata:s:3",
-                     "mimetype=image/png",
-                     "-metadata:s:4",
-                     "mimetype=font/ttf",
-                     path};
-    EXPECT_EQ(program::Run(Join(Args{"ffmpeg", "-v", "error"}, CountedPictures(2), Beeps(2), parts)).code, 0);
+    Ffmpeg(Join(CountedPictures(2), Beeps(2), Args{"-i", folder / "words.srt", "-i", folder / "notes.txt"},
+                Words("-map 0 -map 1 -map 2 -map_metadata 3 -c:s srt -metadata:s language=ger"),
+                Args{"-attach", folder / "cover.png", "-attach", folder / "font.ttf"},
+                Words("-metadata:s:3 mimetype=image/png -metadata:s:4 mimetype=font/ttf"), Args{path}));
     return path;
 }
 
 std::string Probe(const std::string& path) {
-    return program::Run(
-               {"ffprobe", "-v", "quiet", "-show_chapters", "-show_entries",
-                "format_tags:chapter=start_time,end_time:stream=codec_name,codec_type:stream_tags=language",
-                "-of", "compact", path})
-        .out;
+    return test_movies::Ffprobe(path,
+                                Words("-show_chapters -show_entries "
+                                      "format_tags:chapter=start_time,end_time:stream=codec_name,codec_type:"
+                                      "stream_tags=language -of compact"));
 }
 
 TEST(CarryOver, PutsIntoTheFileWhatItsFormatHoldsAndTellsTheRest) {

@@ -20,15 +20,17 @@ using program::Result;
 
 using test_movies::Args;
 using test_movies::CountedPictures;
+using test_movies::FfmpegReads;
+using test_movies::Ffprobe;
 using test_movies::Join;
+using test_movies::Lavfi;
+using test_movies::Words;
 
 /// Three seconds of pictures and sound of two channels in that codec.
-std::string WithSound(const std::string& name, const Args& codec) {
-    return test_movies::Make(
-        name, Join(CountedPictures(3),
-                   Join(Args{"-f", "lavfi", "-i", "aevalsrc=0.4*sin(500*t*t)|0.3*sin(400*t*t):s=48000:d=3",
-                             "-c:v", "mpeg4", "-strict", "-2"},
-                        codec)));
+std::string WithSound(const std::string& name, const std::string& codec) {
+    return test_movies::Make(name, Join(CountedPictures(3),
+                                        Lavfi("aevalsrc=0.4*sin(500*t*t)|0.3*sin(400*t*t):s=48000:d=3"),
+                                        Words("-c:v mpeg4 -strict -2 " + codec)));
 }
 
 /// What a packet of sound holds, and when it is heard.
@@ -39,10 +41,9 @@ struct Packet {
 
 /// Of the first track; headers of broadcasts are taken off, since each packet has one of its own.
 std::vector<Packet> PacketsOf(const std::string& path, bool framed = false) {
-    Args command{"ffmpeg", "-v", "error", "-i", path, "-map", "0:a:0", "-c", "copy", "-copyts"};
-    if (framed)
-        command = Join(command, Args{"-bsf:a", "aac_adtstoasc"});
-    std::istringstream lines(program::Run(Join(command, Args{"-f", "framecrc", "-"})).out);
+    const std::string filter = framed ? "-bsf:a aac_adtstoasc " : "";
+    std::istringstream lines(
+        FfmpegReads(path, Words("-map 0:a:0 -c copy -copyts " + filter + "-f framecrc")));
     std::vector<Packet> packets;
     double unit = 0;
     for (std::string line; std::getline(lines, line);) {
@@ -69,43 +70,35 @@ std::vector<std::string> ContentsOf(const std::vector<Packet>& packets) {
 
 /// The first one may be shown from the file's begin on.
 double SecondPicture(const std::string& path) {
-    const std::string times =
-        program::Run({"ffprobe", "-v", "error", "-select_streams", "v", "-read_intervals", "%+#2",
-                      "-show_entries", "packet=pts_time", "-of", "csv=p=0", path})
-            .out;
+    const std::string times = Ffprobe(
+        path, Words("-select_streams v -read_intervals %+#2 -show_entries packet=pts_time -of csv=p=0"));
     return std::stod(times.substr(times.find('\n') + 1));
 }
 
 std::string SoundOf(const std::string& path) {
-    return program::Run(
-               {"ffmpeg", "-v", "error", "-i", path, "-map", "0:a:0", "-f", "s16le", "-ac", "2", "-"})
-        .out;
+    return FfmpegReads(path, Words("-map 0:a:0 -f s16le -ac 2"));
 }
 
 TEST(CopiedSound, GoesUnchangedIntoWhatHoldsIt) {
     const Folder folder;
     const struct {
         const char* source;
-        Args codec;
+        const char* codec;
         std::vector<const char*> formats;
         std::vector<const char*> refusing;
         std::string toTheSample; ///< The format in which every sample is where it was.
         bool framed = false;
     } cases[] = {
-        {"copied_aac.mp4", {"-c:a", "aac"}, {"mp4", "mov", "mkv", "m4a", "flv"}, {"webm", "mp3"}, "mp4"},
-        {"copied_aac.ts", {"-c:a", "aac"}, {"mp4", "mkv", "flv"}, {"ogg"}, "", true},
-        {"copied_opus.mkv", {"-c:a", "libopus"}, {"mkv", "mp4", "webm", "ogg"}, {"avi", "flv"}, "mkv"},
-        {"copied_vorbis.mkv", {"-c:a", "libvorbis"}, {"mkv", "webm", "ogg"}, {"ts", "mov"}, "mkv"},
-        {"copied_mp3.mp4",
-         {"-c:a", "libmp3lame"},
-         {"mp4", "mkv", "avi", "ts", "mp3", "wav"},
-         {"webm"},
-         "mp4"},
-        {"copied_ac3.ts", {"-c:a", "ac3"}, {"mp4", "mov", "mkv", "avi", "ts", "m4a"}, {"flac"}, "mp4"},
-        {"copied_eac3.mkv", {"-c:a", "eac3"}, {"mp4", "mov", "mkv", "ts"}, {"avi"}, "mkv"},
-        {"copied_flac.mkv", {"-c:a", "flac"}, {"mkv", "flac", "ogg"}, {"mp4", "m4a"}, "flac"},
-        {"copied_dts.mkv", {"-c:a", "dca"}, {"mkv", "ts", "mp4"}, {"mov"}, "mkv"},
-        {"copied_pcm.mov", {"-c:a", "pcm_s24le"}, {"mov", "mkv", "wav"}, {"mp4"}, "mov"},
+        {"copied_aac.mp4", "-c:a aac", {"mp4", "mov", "mkv", "m4a", "flv"}, {"webm", "mp3"}, "mp4"},
+        {"copied_aac.ts", "-c:a aac", {"mp4", "mkv", "flv"}, {"ogg"}, "", true},
+        {"copied_opus.mkv", "-c:a libopus", {"mkv", "mp4", "webm", "ogg"}, {"avi", "flv"}, "mkv"},
+        {"copied_vorbis.mkv", "-c:a libvorbis", {"mkv", "webm", "ogg"}, {"ts", "mov"}, "mkv"},
+        {"copied_mp3.mp4", "-c:a libmp3lame", {"mp4", "mkv", "avi", "ts", "mp3", "wav"}, {"webm"}, "mp4"},
+        {"copied_ac3.ts", "-c:a ac3", {"mp4", "mov", "mkv", "avi", "ts", "m4a"}, {"flac"}, "mp4"},
+        {"copied_eac3.mkv", "-c:a eac3", {"mp4", "mov", "mkv", "ts"}, {"avi"}, "mkv"},
+        {"copied_flac.mkv", "-c:a flac", {"mkv", "flac", "ogg"}, {"mp4", "m4a"}, "flac"},
+        {"copied_dts.mkv", "-c:a dca", {"mkv", "ts", "mp4"}, {"mov"}, "mkv"},
+        {"copied_pcm.mov", "-c:a pcm_s24le", {"mov", "mkv", "wav"}, {"mp4"}, "mov"},
     };
     for (const auto& test : cases) {
         const std::string source = WithSound(test.source, test.codec);
@@ -152,17 +145,17 @@ TEST(CopiedSound, IsInOneClipOrTheOtherAndInStepWithThePictures) {
     constexpr double kClip = 0.92; // 23 pictures
     const struct {
         const char* source;
-        Args codec;
+        const char* codec;
         const char* format;
         double tolerance = 0.0025; ///< Containers round.
-    } cases[] = {{"copied_aac.mp4", {"-c:a", "aac"}, "mp4"},
-                 {"copied_aac.mp4", {"-c:a", "aac"}, "mkv"},
+    } cases[] = {{"copied_aac.mp4", "-c:a aac", "mp4"},
+                 {"copied_aac.mp4", "-c:a aac", "mkv"},
                  // Here the multiplexer moves pictures by the run-up.
-                 {"copied_opus.mkv", {"-c:a", "libopus"}, "mkv", 0.0085},
-                 {"copied_opus.mkv", {"-c:a", "libopus"}, "mp4"},
-                 {"copied_ac3.ts", {"-c:a", "ac3"}, "mp4"},
-                 {"copied_mp3.mp4", {"-c:a", "libmp3lame"}, "mkv"},
-                 {"copied_flac.mkv", {"-c:a", "flac"}, "mkv"}};
+                 {"copied_opus.mkv", "-c:a libopus", "mkv", 0.0085},
+                 {"copied_opus.mkv", "-c:a libopus", "mp4"},
+                 {"copied_ac3.ts", "-c:a ac3", "mp4"},
+                 {"copied_mp3.mp4", "-c:a libmp3lame", "mkv"},
+                 {"copied_flac.mkv", "-c:a flac", "mkv"}};
     for (const auto& test : cases) {
         SCOPED_TRACE(std::string(test.source) + " into " + test.format);
         const std::string source = WithSound(test.source, test.codec);
@@ -192,7 +185,7 @@ TEST(CopiedSound, OfARangeBeginsWithItsFirstWholePacket) {
     const Folder folder;
     for (const char* format : {"mp4", "mkv"}) {
         SCOPED_TRACE(format);
-        const std::string source = WithSound("copied_aac.mp4", {"-c:a", "aac"});
+        const std::string source = WithSound("copied_aac.mp4", "-c:a aac");
         const std::string path = folder / (std::string("out.") + format);
         ASSERT_EQ(Call({source, path, "--audio-codec", "copy", "--begin", "0.8", "--length", "1", "-q"}).code,
                   0);
@@ -211,13 +204,12 @@ TEST(CopiedSound, OfARangeBeginsWithItsFirstWholePacket) {
 TEST(CopiedSound, OfSeveralTracksIsCarriedAsFarAsTheFormatHoldsIt) {
     const Folder folder;
     const std::string source = WithSound(
-        "copied_two.mkv", {"-map", "0", "-map", "1", "-map", "1", "-c:a:0", "aac", "-c:a:1", "libvorbis",
-                           "-metadata:s:a:0", "language=ger", "-metadata:s:a:1", "language=eng"});
+        "copied_two.mkv", "-map 0 -map 1 -map 1 -c:a:0 aac -c:a:1 libvorbis -metadata:s:a:0 language=ger "
+                          "-metadata:s:a:1 language=eng");
     const Result both = Call({source, folder / "both.mkv", "--audio-codec", "copy", "--progress", "none"});
     EXPECT_EQ(both.err, "");
-    EXPECT_EQ(program::Run({"ffprobe", "-v", "error", "-select_streams", "a", "-show_entries",
-                            "stream=codec_name:stream_tags=language", "-of", "csv=p=0", folder / "both.mkv"})
-                  .out,
+    EXPECT_EQ(Ffprobe(folder / "both.mkv", Words("-select_streams a -of csv=p=0 -show_entries "
+                                                 "stream=codec_name:stream_tags=language")),
               "aac,ger\nvorbis,eng\n");
     const Result one = Call({source, folder / "one.ts", "--audio-codec", "copy", "--progress", "none"});
     EXPECT_EQ(one.code, 0);

@@ -179,8 +179,7 @@ TEST(ProgramMaxSize, IsNeverExceeded) {
             if (!input.empty())
                 making = Join(making, Args{"-f", "lavfi", "-i", input});
         const std::string source =
-            Make(std::string("sized-") + test.name + ".mkv",
-                 Join(making, Args{"-c:v", "mpeg4", "-q:v", "2", "-c:a", "pcm_s16le"}));
+            Make(std::string("sized-") + test.name + ".mkv", Join(making, NearLossless()));
         const Folder folder;
         const std::string output = folder / test.output;
         const Result result =

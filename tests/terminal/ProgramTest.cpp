@@ -25,28 +25,19 @@ using program::Call;
 using program::Result;
 using program::Running;
 
-const Args kLossless{"-c:v", "mpeg4", "-q:v", "2", "-c:a", "pcm_s16le"};
-
-std::string Counted() {
-    return Make("counted-av.mkv", Join(CountedPictures(4), Beeps(4), kLossless));
-}
 std::string Flashing() {
     return Make("flashing.mp4",
                 Join(FlashPictures(8), Beeps(8), Args{"-c:v", "libx264", "-bf", "2", "-c:a", "aac"}));
 }
 
-std::string Minute() {
-    return Make("minute.mkv", Join(CountedPictures(60), Beeps(60), kLossless));
-}
-
 /// Slow enough that a test can interfere: many large pictures, but none that a codec keeps for later.
 Args Slowly(const std::string& output) {
-    return {Minute(), output, "--size", "1280x960", "--frame-rate", "100"};
+    return {CountedMovie(60), output, "--size", "1280x960", "--frame-rate", "100"};
 }
 
 TEST(Program, WritesEveryPictureOnceAndAllSound) {
     const Folder folder;
-    const Result result = Call({Counted(), folder / "out.mp4", "--video-rate", "2M"});
+    const Result result = Call({CountedMovie(), folder / "out.mp4", "--video-rate", "2M"});
     ASSERT_EQ(result.code, 0) << result.err;
     EXPECT_EQ(result.err, "");
     EXPECT_NE(result.out.find("100% done"), std::string::npos) << result.out;
@@ -97,7 +88,8 @@ TEST(Program, KeepsSoundAndPicturesInStep) {
         EXPECT_EQ(flashes, test.flashes);
     }
     const Folder folder;
-    const Args slowly = Join(CountedPictures(4), Beeps(4), Args{"-r", "2"}, kLossless); // begin clips late
+    const Args slowly =
+        Join(CountedPictures(4), Beeps(4), Args{"-r", "2"}, NearLossless()); // begin clips late
     const Result slow = Call({Make("slow.mkv", slowly), folder / "slow.mp4", "--split", "1"});
     EXPECT_EQ(slow.code, 0) << slow.err;
 }
@@ -134,12 +126,12 @@ TEST_P(ProgramTakes, AndConvertsAll) {
 }
 
 Args Lossless(double pictureSeconds, double soundSeconds) {
-    return Join(CountedPictures(pictureSeconds), Beeps(soundSeconds), kLossless);
+    return Join(CountedPictures(pictureSeconds), Beeps(soundSeconds), NearLossless());
 }
 
 const Args kVariable = Join(CountedPictures(4), Args{"-vf", "select='lt(mod(n,6),3)'", "-fps_mode", "vfr"});
 const Args kStill = Join(CountedPictures(14), Beeps(14), Args{"-vf", "select='lt(n,1)+gt(n,250)'"},
-                         Args{"-fps_mode", "vfr"}, kLossless);
+                         Args{"-fps_mode", "vfr"}, NearLossless());
 const Args kFast = Join(CountedPictures(1, "240"), Args{"-c:v", "libx264"});
 const Args kMilliseconds = Join(CountedPictures(1), Args{"-enc_time_base", "1/1000", "-fps_mode", "vfr"},
                                 Args{"-vf", "settb=1/1000", "-c:v", "mjpeg"});
@@ -168,7 +160,7 @@ INSTANTIATE_TEST_SUITE_P(Sources, ProgramTakes, testing::ValuesIn(kOddities));
 TEST(Program, TakesNamesInAnyScript) {
     const Folder folder;
     const std::string dashed = folder / "-y";
-    fs::copy_file(Counted(), dashed);
+    fs::copy_file(CountedMovie(), dashed);
     const Args names{"фильм 映画.mp4",   "it's 100%d \"quoted\".tar.mp4", "[a,b].mp4",
                      "\xff\xfe raw.mp4", "file:http:movie.mp4",           std::string(248, 'n') + ".mp4"};
     for (const std::string& name : names) {
@@ -183,7 +175,7 @@ TEST(Program, TakesNamesInAnyScript) {
 TEST(Program, RefusesAndLeavesEverythingAsItWas) {
     const Folder folder;
     const std::string source = folder / "in.mkv";
-    fs::copy_file(Counted(), source);
+    fs::copy_file(CountedMovie(), source);
     fs::create_hard_link(source, folder / "same.mkv");
     fs::create_symlink("nothing.mkv", folder / "link.mkv");
     fs::create_symlink("there.mp4", folder / "linked");
@@ -251,15 +243,15 @@ TEST(Program, RefusesAndLeavesEverythingAsItWas) {
         EXPECT_EQ(folder.Names(), before) << result.err;
     }
     EXPECT_EQ(ReadFile(folder / "there.mp4"), "precious");
-    EXPECT_EQ(ReadFile(source), ReadFile(Counted()));
+    EXPECT_EQ(ReadFile(source), ReadFile(CountedMovie()));
     EXPECT_EQ(Call({source, folder / "there.mp4", "-y"}).code, 0);
     EXPECT_GT(fs::file_size(folder / "there.mp4"), 1000u);
 }
 
 TEST(Program, PrintsValidJsonAndNothingElse) {
     const Folder folder;
-    const Result result = Call({Counted(), folder / "a \"b\"\n\xff.mp4", "--progress", "json", "--split", "2",
-                                "--log", folder / "log"});
+    const Result result = Call({CountedMovie(), folder / "a \"b\"\n\xff.mp4", "--progress", "json", "--split",
+                                "2", "--log", folder / "log"});
     ASSERT_EQ(result.code, 0) << result.err;
     EXPECT_EQ(result.err, "");
     WriteFile(folder / "events", result.out);
@@ -280,8 +272,7 @@ TEST(Program, PrintsValidJsonAndNothingElse) {
 
 TEST(Program, CropsWhatItIsToldOrFinds) {
     const std::string source =
-        Make("bordered.mkv",
-             {"-f", "lavfi", "-i", "testsrc2=s=320x160:d=1,pad=320:240:0:40", "-c:v", "mpeg4", "-q:v", "2"});
+        Make("bordered.mkv", Join(Lavfi("testsrc2=s=320x160:d=1,pad=320:240:0:40"), NearLossless()));
     const Folder folder;
     const struct {
         const char* crop;
@@ -298,7 +289,7 @@ TEST(Program, CropsWhatItIsToldOrFinds) {
         EXPECT_EQ(movie.Info().pictures->width, test.width);
         EXPECT_EQ(movie.Info().pictures->height, test.height);
     }
-    const Result plain = Call({"-y", "--crop", "auto", Counted(), folder / "o.mkv"});
+    const Result plain = Call({"-y", "--crop", "auto", CountedMovie(), folder / "o.mkv"});
     EXPECT_NE(plain.err.find("no black borders"), std::string::npos) << plain.err;
     const Result tooMuch = Call({"-y", "--crop", "120:110:0:0", source, folder / "o.mkv"});
     EXPECT_EQ(tooMuch.code, 2);
@@ -308,14 +299,15 @@ TEST(Program, CropsWhatItIsToldOrFinds) {
 TEST(Program, KeepsAPreview) {
     const Folder folder;
     for (const Args& options : {Args{}, Args{"--no-audio"}, Args{"--length", "0.5"}}) {
-        const Args preview{Counted(), folder / "out.mp4", "-y", "--preview", folder / "now.png"};
+        const Args preview{CountedMovie(), folder / "out.mp4", "-y", "--preview", folder / "now.png"};
         ASSERT_EQ(Call(Join(preview, options)).code, 0);
         const Seen seen = LookAt(folder / "now.png");
         ASSERT_EQ(seen.pictures.size(), 1u);
         EXPECT_EQ(seen.pictures[0].width, 160);
         EXPECT_NEAR(seen.pictures[0].luma, LumaOf(options.size() < 2 ? 99 : 12), 2);
         WriteFile(folder / "there.png", "precious"); // replaced by leave only, a preview of before without
-        EXPECT_EQ(Call({Counted(), folder / "out.mp4", "-y", "--preview", folder / "there.png"}).code, 0);
+        EXPECT_EQ(Call({CountedMovie(), folder / "out.mp4", "-y", "--preview", folder / "there.png"}).code,
+                  0);
         EXPECT_EQ(LookAt(folder / "there.png").pictures.size(), 1u);
     }
 
@@ -335,8 +327,8 @@ TEST(Program, KeepsAPreview) {
     EXPECT_EQ(ReadFile(folder / "now.png"), "precious");
     EXPECT_EQ(folder.Names(), (Args{"now.png", "out.mp4", "slow.mp4", "there.png"}));
 
-    const Result without =
-        Call({Counted(), folder / "out.mkv", "--preview", folder / "nowhere/now.png", "--progress", "none"});
+    const Result without = Call(
+        {CountedMovie(), folder / "out.mkv", "--preview", folder / "nowhere/now.png", "--progress", "none"});
     EXPECT_EQ(without.code, 0);
     EXPECT_NE(without.err.find("nowhere/now.png\": No such file"), std::string::npos) << without.err;
     EXPECT_EQ(without.out.find("100% done"), 0u) << without.out;
@@ -344,10 +336,10 @@ TEST(Program, KeepsAPreview) {
 
 TEST(Program, TellsAboutSourcesFormatsAndRoom) {
     const Folder folder;
-    const Result info = Call({"--info", Counted()});
+    const Result info = Call({"--info", CountedMovie()});
     EXPECT_EQ(info.code, 0);
     EXPECT_NE(info.out.find("160 x 120"), std::string::npos) << info.out;
-    const Result estimate = Call({"--estimate", Counted(), "out.mp4"});
+    const Result estimate = Call({"--estimate", CountedMovie(), "out.mp4"});
     EXPECT_EQ(estimate.code, 0) << estimate.err;
     EXPECT_NE(estimate.out.find("320.0 kB"), std::string::npos) << estimate.out; // 640 kbit/s for 4 s
     EXPECT_NE(estimate.out.find("are free in \".\""), std::string::npos) << estimate.out;
@@ -381,7 +373,8 @@ TEST(Program, GetsAlongWithWhateverStandardStreams) {
 TEST(Program, AppendsToItsOwnLogsAndByLeaveToOthers) {
     const Folder folder;
     const auto call = [&](const std::string& log, const char* leave) {
-        return Call({Counted(), folder / "out.mp4", leave, "--length", "0.2", "--log", folder / log}).code;
+        return Call({CountedMovie(), folder / "out.mp4", leave, "--length", "0.2", "--log", folder / log})
+            .code;
     };
     WriteFile(folder / "empty", "");
     WriteFile(folder / "letter", "Dear reader,\n");
@@ -449,7 +442,7 @@ TEST(Program, GoesOnIgnoringWhatItsCallerIgnores) {
     const Folder folder;
     for (const int signal : {SIGHUP, SIGINT, SIGTERM}) {
         const auto usual = std::signal(signal, SIG_IGN); // which the program inherits
-        Running running({Counted(), folder / "out.mp4", "-y", "--progress", "json"}, false);
+        Running running({CountedMovie(), folder / "out.mp4", "-y", "--progress", "json"}, false);
         std::signal(signal, usual);
         ASSERT_TRUE(running.WaitFor("clip_opened"));
         running.Jam();
@@ -529,7 +522,7 @@ TEST(Program, KeepsWhatIsDoneOnAFullDiskRemovesItOrWaits) {
     const SmallDisk disk(folder / "disk", "600k");
     if (!disk.IsThere())
         GTEST_SKIP() << "no small disk can be mounted here";
-    const Args making{Minute(), folder / "disk/out.mov", "--audio-codec", "PCM"};
+    const Args making{CountedMovie(60), folder / "disk/out.mov", "--audio-codec", "PCM"};
     const Result result = Call(making);
     EXPECT_EQ(result.code, 5) << result.err;
     EXPECT_NE(result.err.find("out.mov"), std::string::npos);
@@ -559,7 +552,7 @@ TEST(Program, ConvertsAllAlthoughTheLogCannotBeWritten) {
     if (!disk.IsThere())
         GTEST_SKIP() << "no small disk can be mounted here";
     WriteFile(folder / "disk/much", std::string(1'000'000, 'x'));
-    const Result result = Call({Counted(), folder / "out.mp4", "--log", folder / "disk/log"});
+    const Result result = Call({CountedMovie(), folder / "out.mp4", "--log", folder / "disk/log"});
     EXPECT_EQ(result.code, 0) << result.err;
     EXPECT_EQ(LookAt(folder / "out.mp4").pictures.size(), 100u);
     EXPECT_EQ(ReadFile(folder / "disk/log"), "");

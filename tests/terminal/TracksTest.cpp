@@ -14,41 +14,24 @@ using program::Result;
 
 using test_movies::Args;
 using test_movies::CountedPictures;
+using test_movies::FfmpegReads;
+using test_movies::Ffprobe;
 using test_movies::Join;
+using test_movies::Lavfi;
+using test_movies::Words;
 
 /// Six seconds: German sound of one channel, English comments of two at another rate, which begin late.
 std::string TwoSounds() {
-    const Args sounds{"-f",         "lavfi",
-                      "-i",         "aevalsrc=0.4*sin(500*t*t):s=48000:d=6",
-                      "-f",         "lavfi",
-                      "-itsoffset", "0.5",
-                      "-i",         "aevalsrc=0.4*sin(700*t*t)|0.3*sin(400*t*t):s=44100:d=5"};
-    const Args outputs{"-map",
-                       "0",
-                       "-map",
-                       "1",
-                       "-map",
-                       "2",
-                       "-c:v",
-                       "mpeg4",
-                       "-c:a",
-                       "flac",
-                       "-metadata:s:a:0",
-                       "language=ger",
-                       "-metadata:s:a:1",
-                       "language=eng",
-                       "-metadata:s:a:1",
-                       "title=Comments",
-                       "-disposition:a:1",
-                       "comment"};
+    const Args sounds = Join(Lavfi("aevalsrc=0.4*sin(500*t*t):s=48000:d=6"), Words("-itsoffset 0.5"),
+                             Lavfi("aevalsrc=0.4*sin(700*t*t)|0.3*sin(400*t*t):s=44100:d=5"));
+    const Args outputs =
+        Words("-map 0 -map 1 -map 2 -c:v mpeg4 -c:a flac -metadata:s:a:0 language=ger "
+              "-metadata:s:a:1 language=eng -metadata:s:a:1 title=Comments -disposition:a:1 comment");
     return test_movies::Make("two_sounds.mkv", Join(CountedPictures(6), sounds, outputs));
 }
 
 std::string SoundOf(const std::string& path, int track) {
-    const Result read = program::Run(
-        {"ffmpeg", "-v", "error", "-i", path, "-map", "0:a:" + std::to_string(track), "-f", "s16le", "-"});
-    EXPECT_EQ(read.err, "") << path;
-    return read.out;
+    return FfmpegReads(path, Words("-f s16le -map 0:a:" + std::to_string(track)));
 }
 
 TEST(Tracks, FurtherSoundComesIntoEveryFormatThatHoldsSeveral) {
@@ -59,10 +42,9 @@ TEST(Tracks, FurtherSoundComesIntoEveryFormatThatHoldsSeveral) {
         ASSERT_EQ(made.code, 0) << made.err;
         EXPECT_EQ(made.err.find("not carried: sound"), std::string::npos) << made.err;
         const std::string read =
-            program::Run({"ffprobe", "-v", "error", "-select_streams", "a", "-show_entries",
-                          "stream=channels,sample_rate:stream_tags=language:stream_disposition=comment",
-                          "-of", "compact", folder / name})
-                .out;
+            Ffprobe(folder / name, Words("-select_streams a -of compact -show_entries "
+                                         "stream=channels,sample_rate:stream_tags=language:"
+                                         "stream_disposition=comment"));
         EXPECT_NE(read.find("channels=1"), std::string::npos) << read;
         EXPECT_GT(read.find("channels=2"), read.find("channels=1")) << read;
         EXPECT_NE(read.find("channels=2"), std::string::npos) << read;
@@ -102,20 +84,18 @@ TEST(Tracks, ClipsJoinToTheSample) {
 
 /// Six seconds with texts of which two overlap and one lies over 4 s.
 std::string WithTexts() {
-    const Folder folder;
-    WriteFile(folder / "words.srt", "1\n00:00:00,500 --> 00:00:01,500\nFirst\n\n"
-                                    "2\n00:00:01,200 --> 00:00:02,800\nMore <i>words</i>\n\n"
-                                    "3\n00:00:03,500 --> 00:00:04,600\nOver the cut\n");
-    return test_movies::Make(
-        "with_texts.mkv",
-        Join(CountedPictures(6), Args{"-i", folder / "words.srt", "-c:v", "mpeg4", "-c:s", "srt", "-map", "0",
-                                      "-map", "1", "-metadata:s:s:0", "language=fre"}));
+    const std::string words =
+        test_movies::Part("words.srt", "1\n00:00:00,500 --> 00:00:01,500\nFirst\n\n"
+                                       "2\n00:00:01,200 --> 00:00:02,800\nMore <i>words</i>\n\n"
+                                       "3\n00:00:03,500 --> 00:00:04,600\nOver the cut\n");
+    return test_movies::Make("with_texts.mkv",
+                             Join(CountedPictures(6), Args{"-i", words},
+                                  Words("-c:v mpeg4 -c:s srt -map 0 -map 1 -metadata:s:s:0 language=fre")));
 }
 
 /// The texts of a movie's first track of subtitles as FFmpeg reads them, from the begin of its pictures.
 std::string TextsOf(const std::string& path) {
-    const std::string cues =
-        program::Run({"ffmpeg", "-v", "error", "-i", path, "-map", "0:s:0", "-f", "srt", "-"}).out;
+    const std::string cues = FfmpegReads(path, Words("-map 0:s:0 -f srt"));
     std::string text;
     for (const char letter : cues)
         text += letter == '\n' ? " " : letter == '\r' ? "" : std::string(1, letter);
@@ -168,14 +148,10 @@ TEST(Tracks, TextsComeInTheFormatsOwnFormAndAreCutWithTheMovie) {
         ASSERT_EQ(made.code, 0) << made.err;
         EXPECT_EQ(made.err, "");
         EXPECT_EQ(TextsOf(folder / test.file), test.texts);
-        EXPECT_NE(program::Run(
-                      {"ffprobe", "-v", "error", "-show_entries", "stream_tags=language", folder / test.file})
-                      .out.find("language=fre"),
-                  std::string::npos);
-        const Result decoded =
-            program::Run({"ffmpeg", "-v", "error", "-i", folder / test.file, "-f", "null", "-"});
-        EXPECT_EQ(decoded.code, 0);
-        EXPECT_EQ(decoded.err, "");
+        EXPECT_NE(
+            Ffprobe(folder / test.file, Words("-show_entries stream_tags=language")).find("language=fre"),
+            std::string::npos);
+        FfmpegReads(folder / test.file, Words("-f null"));
     }
     const Result other = Call({WithTexts(), folder / "a.avi", "--progress", "none"});
     EXPECT_EQ(other.err,
@@ -198,10 +174,8 @@ TEST(Tracks, AreChosenByNumberOrLanguage) {
             Call(Join(Args{TwoSounds(), folder / "out.mkv", "--length", "0.5", "-y", "-q"}, options));
         EXPECT_EQ(made.code, 0) << made.err;
         std::string languages;
-        const std::string read =
-            program::Run({"ffprobe", "-v", "error", "-select_streams", "a", "-show_entries",
-                          "stream_tags=language", "-of", "csv=p=0", folder / "out.mkv"})
-                .out;
+        const std::string read = Ffprobe(
+            folder / "out.mkv", Words("-select_streams a -show_entries stream_tags=language -of csv=p=0"));
         for (const char letter : read)
             languages += letter == '\n' ? ' ' : letter;
         return languages;
@@ -217,7 +191,7 @@ TEST(Tracks, AreChosenByNumberOrLanguage) {
         << none.err;
     EXPECT_EQ(Call({WithTexts(), folder / "no.mkv", "--subtitles", "0"}).code, 2);
     ASSERT_EQ(Call({WithTexts(), folder / "no.mkv", "--subtitles", "none", "-q"}).code, 0);
-    EXPECT_EQ(TextsOf(folder / "no.mkv"), "");
+    EXPECT_EQ(Ffprobe(folder / "no.mkv", Words("-select_streams s -show_entries stream=index")), "");
 }
 
 TEST(Tracks, TextsComeFromFilesInAnyCharacterSet) {
@@ -239,9 +213,8 @@ TEST(Tracks, TextsComeFromFilesInAnyCharacterSet) {
                                  "e  ";
     EXPECT_EQ(texts({"--subtitle-file", folder / "utf8.srt"}), expected);
     EXPECT_EQ(texts({"--subtitle-file", folder / "western.srt:de"}), expected);
-    EXPECT_NE(program::Run({"ffprobe", "-v", "error", "-show_entries", "stream_tags=language",
-                            "-select_streams", "s", folder / "out.mp4"})
-                  .out.find("language=ger"),
+    EXPECT_NE(Ffprobe(folder / "out.mp4", Words("-show_entries stream_tags=language -select_streams s"))
+                  .find("language=ger"),
               std::string::npos);
     EXPECT_EQ(texts({"--subtitle-file", folder / "greek.srt", "--subtitle-charset", "ISO-8859-7"}),
               "1 00:00:00,500 --> 00:00:01,000 \xCE\xB1  ");
@@ -261,9 +234,7 @@ TEST(Tracks, TextsAboutTheMovieAreReplacedOrLeftOut) {
               0);
     const auto tags = [&](const Args& options) {
         EXPECT_EQ(Call(Join(options, Args{folder / "a.mkv", folder / "b.mkv", "-y", "-q"})).code, 0);
-        return program::Run({"ffprobe", "-v", "error", "-show_entries", "format_tags=title,artist", "-of",
-                             "compact", folder / "b.mkv"})
-            .out;
+        return Ffprobe(folder / "b.mkv", Words("-show_entries format_tags=title,artist -of compact"));
     };
     EXPECT_EQ(tags({}), "format|tag:title=Old|tag:ARTIST=Nobody\n");
     EXPECT_EQ(tags({"--metadata", "Artist=", "--metadata", "title=New=Newer"}),

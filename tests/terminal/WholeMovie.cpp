@@ -15,7 +15,12 @@ namespace whole_movie {
 namespace {
 
 using test_movies::Args;
+using test_movies::FfmpegReads;
+using test_movies::Ffprobe;
 using test_movies::Join;
+using test_movies::Lavfi;
+using test_movies::Part;
+using test_movies::Words;
 
 constexpr int kWidth = 60;
 constexpr int kHeight = 16;
@@ -40,39 +45,40 @@ std::string Composition(uint32_t number, bool shows) {
     return data;
 }
 
-void Ffmpeg(const Args& arguments) {
-    const program::Result made = program::Run(Join(Args{"ffmpeg", "-v", "error", "-y"}, arguments));
-    EXPECT_EQ(made.code, 0) << made.err;
-}
+constexpr const char* kWords = "1\n00:00:00,500 --> 00:00:01,200\nPlain <i>words</i>\n\n"
+                               "2\n00:00:01,400 --> 00:00:02,400\nGr\xC3\xBC\xC3\x9F"
+                               "e, \xD0\xB4\xD0\xB2\xD0\xB0\n";
+constexpr const char* kSigns =
+    "[Script Info]\nScriptType: v4.00+\nPlayResX: 160\nPlayResY: 120\n\n[V4+ Styles]\n"
+    "Format: Name, Fontname, Fontsize, PrimaryColour, SecondaryColour, OutlineColour, BackColour, "
+    "Bold, Italic, Underline, StrikeOut, ScaleX, ScaleY, Spacing, Angle, BorderStyle, Outline, "
+    "Shadow, Alignment, MarginL, MarginR, MarginV, Encoding\n"
+    "Style: Default,DejaVu Sans,20,&H00FFFFFF,&H0,&H0,&H0,0,0,0,0,100,100,0,0,1,1,0,2,5,5,5,1\n\n"
+    "[Events]\nFormat: Layer, Start, End, Style, Name, MarginL, MarginR, MarginV, Effect, Text\n"
+    "Dialogue: 0,0:00:00.30,0:00:01.50,Default,,0,0,0,,{\\pos(20,20)}A sign\n"
+    "Dialogue: 1,0:00:01.00,0:00:02.00,Default,Anna,0,0,0,,{\\b1}Bold{\\b0} and plain\n";
+constexpr const char* kNotes =
+    ";FFMETADATA1\ntitle=The whole\nartist=Nobody & S\xC3\xB6hne\nalbum=Collected\n"
+    "album_artist=All\ndate=2021-05-04\ncomment=Said \\= so\\; it\\#s\ndescription=Long text\n"
+    "genre=Test\ncomposer=One\ncopyright=Free\ncreation_time=2021-05-04T10:11:12.000000Z\n"
+    "location=+48.1000+011.6000/\nshow=Series\nperformer=Some\n"
+    "[CHAPTER]\nTIMEBASE=1/1000\nSTART=0\nEND=500\ntitle=First\n"
+    "[CHAPTER]\nTIMEBASE=1/1000\nSTART=500\nEND=2000\ntitle=Zweites St\xC3\xBC"
+    "ck\n"
+    "[CHAPTER]\nTIMEBASE=1/1000\nSTART=2000\nEND=3000\ntitle=Last\n";
 
-void WriteParts(const Folder& folder) {
-    WriteFile(folder / "words.srt", "1\n00:00:00,500 --> 00:00:01,200\nPlain <i>words</i>\n\n"
-                                    "2\n00:00:01,400 --> 00:00:02,400\nGr\xC3\xBC\xC3\x9F"
-                                    "e, \xD0\xB4\xD0\xB2\xD0\xB0\n");
-    WriteFile(folder / "signs.ass",
-              "[Script Info]\nScriptType: v4.00+\nPlayResX: 160\nPlayResY: 120\n\n[V4+ Styles]\n"
-              "Format: Name, Fontname, Fontsize, PrimaryColour, SecondaryColour, OutlineColour, BackColour, "
-              "Bold, Italic, Underline, StrikeOut, ScaleX, ScaleY, Spacing, Angle, BorderStyle, Outline, "
-              "Shadow, Alignment, MarginL, MarginR, MarginV, Encoding\n"
-              "Style: Default,DejaVu Sans,20,&H00FFFFFF,&H0,&H0,&H0,0,0,0,0,100,100,0,0,1,1,0,2,5,5,5,1\n\n"
-              "[Events]\nFormat: Layer, Start, End, Style, Name, MarginL, MarginR, MarginV, Effect, Text\n"
-              "Dialogue: 0,0:00:00.30,0:00:01.50,Default,,0,0,0,,{\\pos(20,20)}A sign\n"
-              "Dialogue: 1,0:00:01.00,0:00:02.00,Default,Anna,0,0,0,,{\\b1}Bold{\\b0} and plain\n");
-    WriteFile(folder / "bits.sup", BitmapSubtitles({{0.2, 0.8}, {1.5, 2.5}}));
-    WriteFile(folder / "font.ttf", std::string(30000, 'f'));
-    WriteFile(folder / "notes.txt",
-              ";FFMETADATA1\ntitle=The whole\nartist=Nobody & S\xC3\xB6hne\nalbum=Collected\n"
-              "album_artist=All\ndate=2021-05-04\ncomment=Said \\= so\\; it\\#s\ndescription=Long text\n"
-              "genre=Test\ncomposer=One\ncopyright=Free\ncreation_time=2021-05-04T10:11:12.000000Z\n"
-              "location=+48.1000+011.6000/\nshow=Series\nperformer=Some\n"
-              "[CHAPTER]\nTIMEBASE=1/1000\nSTART=0\nEND=500\ntitle=First\n"
-              "[CHAPTER]\nTIMEBASE=1/1000\nSTART=500\nEND=2000\ntitle=Zweites St\xC3\xBC"
-              "ck\n"
-              "[CHAPTER]\nTIMEBASE=1/1000\nSTART=2000\nEND=3000\ntitle=Last\n");
-    Ffmpeg({"-copyts", "-i", folder / "bits.sup", "-c:s", "dvdsub", folder / "dvd.mkv"});
-    Ffmpeg({"-copyts", "-i", folder / "bits.sup", "-c:s", "dvbsub", "-muxdelay", "0", "-muxpreload", "0",
-            folder / "dvb.ts"});
-    Ffmpeg({"-f", "lavfi", "-i", "testsrc=s=48x32", "-frames:v", "1", folder / "cover.png"});
+/// Subtitles of five kinds, and the texts about the movie.
+Args Texts() {
+    const Args bits{"-copyts", "-i", Part("bits.sup", BitmapSubtitles({{0.2, 0.8}, {1.5, 2.5}}))};
+    const std::string dvd = test_movies::Make("dvd.mkv", Join(bits, Words("-c:s dvdsub")));
+    const std::string dvb =
+        test_movies::Make("dvb.ts", Join(bits, Words("-c:s dvbsub -muxdelay 0 -muxpreload 0")));
+    return {"-i", Part("words.srt", kWords),
+            "-i", Part("signs.ass", kSigns),
+            "-i", bits.back(),
+            "-i", dvd,
+            "-i", dvb,
+            "-i", Part("notes.txt", kNotes)};
 }
 
 /// -OPTION:KIND:NUMBER VALUE for each of `values` that is not empty.
@@ -112,20 +118,20 @@ std::string BitmapSubtitles(const std::vector<std::pair<double, double>>& cues) 
 }
 
 std::string Make(bool black) {
-    const Folder folder;
-    WriteParts(folder);
-    Args inputs{"-copyts", "-f", "lavfi", "-i",
-                std::string(black ? "color=black" : "testsrc") + (black ? ":" : "=") + "s=160x120:r=10:d=3"};
-    for (const char* sound : {"sine=300:d=3:r=48000", "aevalsrc=0.3*sin(4000*t)|0.2*sin(2000*t):d=3:s=44100",
-                              "sine=700:d=3:r=48000"})
-        inputs = Join(inputs, Args{"-f", "lavfi", "-i", sound});
-    for (const char* name : {"words.srt", "signs.ass", "bits.sup", "dvd.mkv", "dvb.ts", "notes.txt"})
-        inputs = Join(inputs, Args{"-i", folder / name});
-    for (int input = 0; input < 9; ++input)
-        inputs = Join(inputs, Args{"-map", std::to_string(input)});
+    const std::string pictures = std::string(black ? "color=black:" : "testsrc=") + "s=160x120:r=10:d=3";
+    const Args inputs =
+        Join(Args{"-copyts"},
+             Lavfi(pictures, "sine=300:d=3:r=48000", "aevalsrc=0.3*sin(4000*t)|0.2*sin(2000*t):d=3:s=44100",
+                   "sine=700:d=3:r=48000"),
+             Texts());
+    const std::string cover =
+        test_movies::Make("cover.png", Join(Lavfi("testsrc=s=48x32"), Words("-frames:v 1")));
+    const std::string font = Part("font.ttf", std::string(30000, 'f'));
     return test_movies::Make(
         black ? "black.mkv" : "everything.mkv",
-        Join(inputs, Args{"-map_metadata", "9", "-c:v", "mpeg4", "-c:a", "flac", "-c:s", "copy"},
+        Join(inputs,
+             Words("-map 0 -map 1 -map 2 -map 3 -map 4 -map 5 -map 6 -map 7 -map 8 -map_metadata 9 "
+                   "-c:v mpeg4 -c:a flac -c:s copy"),
              ForEach("-metadata:s", "v:", "language=", {"eng"}),
              ForEach("-metadata:s", "v:", "title=", {"View"}),
              ForEach("-metadata:s", "a:", "language=", {"ger", "swe", "fre"}),
@@ -134,14 +140,13 @@ std::string Make(bool black) {
              ForEach("-metadata:s", "s:", "language=", {"ger", "jpn", "spa", "ita", "swe"}),
              ForEach("-metadata:s", "s:", "title=", {"Texte", "Signs", "", "", ""}),
              ForEach("-disposition", "s:", "", {"forced", "0", "hearing_impaired", "0", "0"}),
-             Args{"-attach", folder / "cover.png", "-attach", folder / "font.ttf"},
+             Args{"-attach", cover, "-attach", font},
              ForEach("-metadata:s", "t:", "mimetype=", {"image/png", "font/ttf"})));
 }
 
 Json Probe(const std::string& path) {
-    const program::Result read = program::Run({"ffprobe", "-v", "quiet", "-of", "json", "-show_format",
-                                               "-show_streams", "-show_chapters", "-show_programs", path});
-    return Json::parse(read.out);
+    return Json::parse(
+        Ffprobe(path, Words("-of json -show_format -show_streams -show_chapters -show_programs")));
 }
 
 Json Identify(const std::string& path) {
@@ -173,13 +178,9 @@ std::vector<std::pair<std::string, std::string>> TagsOf(const Json& probe) {
 
 std::vector<Cue> CuesOf(const std::string& path, int number) {
     const std::string first =
-        program::Run({"ffprobe", "-v", "error", "-select_streams", "v:0", "-show_entries",
-                      "stream=start_time", "-of", "default=nk=1:nw=1", path})
-            .out;
+        Ffprobe(path, Words("-select_streams v:0 -show_entries stream=start_time -of default=nk=1:nw=1"));
     const int start = static_cast<int>(std::lround(std::strtod(first.c_str(), nullptr) * 1000));
-    const std::string texts = program::Run({"ffmpeg", "-v", "error", "-copyts", "-i", path, "-map",
-                                            "0:s:" + std::to_string(number), "-f", "srt", "-"})
-                                  .out;
+    const std::string texts = FfmpegReads(path, Words("-copyts -f srt -map 0:s:" + std::to_string(number)));
     static const std::regex kTimes(R"((\d+):(\d+):(\d+),(\d+) --> (\d+):(\d+):(\d+),(\d+)\s*)");
     static const std::regex kMarks("<[^>]*>|\r");
     std::vector<Cue> cues;
@@ -204,9 +205,8 @@ std::vector<Cue> CuesOf(const std::string& path, int number) {
 
 std::vector<int> PacketsOf(const std::string& path, int number) {
     std::istringstream lines(
-        program::Run({"ffprobe", "-v", "error", "-select_streams", "s:" + std::to_string(number),
-                      "-show_entries", "packet=size", "-of", "default=nk=1:nw=1", path})
-            .out);
+        Ffprobe(path, Words("-show_entries packet=size -of default=nk=1:nw=1 -select_streams s:" +
+                            std::to_string(number))));
     std::vector<int> sizes;
     for (int size = 0; lines >> size;)
         sizes.push_back(size);

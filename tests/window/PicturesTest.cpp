@@ -165,45 +165,15 @@ TEST_F(PicturesTest, TellsWhatGoesWrongInWords) {
 }
 
 TEST_F(PicturesTest, CarriesTheTracksThatAreChosen) {
-    WriteFile(folder / "a.srt", "1\n00:00:00,500 --> 00:00:01,500\nGrüße\n");
-    const std::string movie = test_movies::Make("window-tracks.mkv", {"-f",
-                                                                      "lavfi",
-                                                                      "-i",
-                                                                      "testsrc2=s=320x180:r=25",
-                                                                      "-f",
-                                                                      "lavfi",
-                                                                      "-i",
-                                                                      "sine=440",
-                                                                      "-f",
-                                                                      "lavfi",
-                                                                      "-i",
-                                                                      "sine=880",
-                                                                      "-i",
-                                                                      folder / "a.srt",
-                                                                      "-map",
-                                                                      "0",
-                                                                      "-map",
-                                                                      "1",
-                                                                      "-map",
-                                                                      "2",
-                                                                      "-map",
-                                                                      "3",
-                                                                      "-t",
-                                                                      "2",
-                                                                      "-c:v",
-                                                                      "libx264",
-                                                                      "-preset",
-                                                                      "ultrafast",
-                                                                      "-c:a",
-                                                                      "aac",
-                                                                      "-c:s",
-                                                                      "srt",
-                                                                      "-metadata:s:a:0",
-                                                                      "language=eng",
-                                                                      "-metadata:s:a:1",
-                                                                      "language=ger",
-                                                                      "-metadata:s:s:0",
-                                                                      "language=fre"});
+    const std::string words = test_movies::Part("a.srt", "1\n00:00:00,500 --> 00:00:01,500\nGrüße\n");
+    const std::string movie = test_movies::Make(
+        "window-tracks.mkv",
+        test_movies::Join(
+            test_movies::Lavfi("testsrc2=s=320x180:r=25", "sine=440", "sine=880"),
+            test_movies::Args{"-i", words},
+            test_movies::Words("-map 0 -map 1 -map 2 -map 3 -t 2 -c:v libx264 -preset ultrafast "
+                               "-c:a aac -c:s srt -metadata:s:a:0 language=eng "
+                               "-metadata:s:a:1 language=ger -metadata:s:s:0 language=fre")));
     app.TheQueue().SetNaming({QStringLiteral("{name}"), folder.Path()});
     app.TheQueue().Add({movie});
     AwaitExamined(1);
