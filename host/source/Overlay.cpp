@@ -26,6 +26,33 @@ Weights WeightsOf(int matrix) {
     return {0.2126, 0.0722};
 }
 
+/// What a pixel of a canvas adds to a picture of 8 bits in video range.
+struct Drawn {
+    double luma;
+    double blue;
+    double red;
+    double opacity; ///< 0 to 1.
+};
+
+Drawn DrawnBy(const uint8_t* pixel, const Weights& weights, double white) {
+    const double opacity = pixel[3] / 255.0;
+    const double r = pixel[0] / 255.0 * white;
+    const double g = pixel[1] / 255.0 * white;
+    const double b = pixel[2] / 255.0 * white;
+    const double luma = weights.red * r + (1 - weights.red - weights.blue) * g + weights.blue * b;
+    return {16 * opacity + 219 * luma, 128 * opacity + 112 * (b - luma) / (1 - weights.blue),
+            128 * opacity + 112 * (r - luma) / (1 - weights.red), opacity};
+}
+
+/// Null outside.
+const uint8_t* PixelAt(const Canvas& canvas, int column, int row) {
+    if (column < 0 || column >= canvas.width || row < 0 || row >= canvas.height)
+        return nullptr;
+    const size_t pixel =
+        static_cast<size_t>(row) * static_cast<size_t>(canvas.width) + static_cast<size_t>(column);
+    return &canvas.pixels[pixel * kChannels];
+}
+
 /// Floor for negative numbers, too.
 int Even(int number) {
     return number & ~1;
@@ -76,37 +103,25 @@ Overlay::Overlay(const Canvas& canvas, const OverlayColours& colours, bool deep)
         planes_[plane] = {std::vector<uint16_t>(count / 4), std::vector<uint16_t>(count / 4, 255)};
     const Weights weights = WeightsOf(colours.matrix);
     const double scale = deep ? 4 : 1;
-    const auto at = [&](int x, int y) -> const uint8_t* {
-        const int column = x + x_ - canvas.x;
-        const int row = y + y_ - canvas.y;
-        const bool isInside = column >= 0 && column < canvas.width && row >= 0 && row < canvas.height;
-        return isInside ? &canvas.pixels[(static_cast<size_t>(row) * static_cast<size_t>(canvas.width) +
-                                          static_cast<size_t>(column)) *
-                                         kChannels]
-                        : nullptr;
-    };
     for (int y = 0; y < height_; y += 2)
         for (int x = 0; x < width_; x += 2) {
             double blue = 0; // of four pixels, as their opacity
             double red = 0;
             double opacity = 0;
             for (int i = 0; i < 4; ++i) {
-                const uint8_t* pixel = at(x + i % 2, y + i / 2);
+                const int column = x + i % 2;
+                const int row = y + i / 2;
+                const uint8_t* pixel = PixelAt(canvas, column + x_ - canvas.x, row + y_ - canvas.y);
                 if (pixel == nullptr)
                     continue;
-                const double alpha = pixel[3] / 255.0;
-                const double r = pixel[0] / 255.0 * colours.white;
-                const double g = pixel[1] / 255.0 * colours.white;
-                const double b = pixel[2] / 255.0 * colours.white;
-                const double luma = weights.red * r + (1 - weights.red - weights.blue) * g + weights.blue * b;
-                const size_t index = static_cast<size_t>(y + i / 2) * static_cast<size_t>(width_) +
-                                     static_cast<size_t>(x + i % 2);
-                planes_[0].value[index] =
-                    static_cast<uint16_t>(std::lround((16 * alpha + 219 * luma) * scale));
+                const Drawn drawn = DrawnBy(pixel, weights, colours.white);
+                const size_t index =
+                    static_cast<size_t>(row) * static_cast<size_t>(width_) + static_cast<size_t>(column);
+                planes_[0].value[index] = static_cast<uint16_t>(std::lround(drawn.luma * scale));
                 planes_[0].rest[index] = static_cast<uint16_t>(255 - pixel[3]);
-                blue += (128 * alpha + 112 * (b - luma) / (1 - weights.blue)) / 4;
-                red += (128 * alpha + 112 * (r - luma) / (1 - weights.red)) / 4;
-                opacity += alpha / 4;
+                blue += drawn.blue / 4;
+                red += drawn.red / 4;
+                opacity += drawn.opacity / 4;
             }
             const size_t index =
                 static_cast<size_t>(y / 2) * static_cast<size_t>(width_ / 2) + static_cast<size_t>(x / 2);
