@@ -9,8 +9,9 @@
 // Every kernel is flattened: one loop without a call, its constants in registers.
 //
 // Widths: whole blocks, then the last whole block of an even width once more over what has been written,
-// which gives the same bytes. Pictures narrower than a block go to the next lower level, an odd last column
-// to the plain kernels, while its row is near.
+// which gives the same bytes. Pictures narrower than a block go to the next lower level. An odd last column
+// is made while its row is near: in place where that is short, since a call would make the vectors load their
+// constants anew for every row, else by the plain kernels.
 #ifndef MOVIECONV_COMMON_IMAGE_KERNELS_LANEBLOCKS_H
 #define MOVIECONV_COMMON_IMAGE_KERNELS_LANEBLOCKS_H
 

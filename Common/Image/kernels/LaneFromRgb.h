@@ -168,23 +168,45 @@ struct LaneFromRgb {
         StoreAlternating(target.u, target.v, StoredChroma<2>(AddRows(first, second)));
     }
 
+    /// One pixel in each of two rows, an odd last column, by the equations as they are.
+    template <class Form>
+    static void RgbPixelsTo420(PlanesPair target, RowPair rgb) {
+        const auto sum = [](const uint8_t* p, int blue, int green, int red) {
+            return (blue * p[0] + green * p[1] + red * p[2] + Form::kRounding) >> 16;
+        };
+        const auto luma = [&](const uint8_t* p) {
+            constexpr int kBlue = Form::kYOuterBlue * Form::kYInnerBlue;
+            constexpr int kGreen = Form::kYOuterGreen * Form::kYInnerGreen;
+            constexpr int kRed =
+                Form::kYOuterBlue * Form::kYBesideBlue + Form::kYOuterGreen * Form::kYBesideGreen;
+            return static_cast<uint8_t>(sum(p, kBlue, kGreen, kRed) + 16);
+        };
+        const auto average = [&](int blue, int green, int all) {
+            const int red = all - blue - green;
+            const int both = sum(rgb.first, blue, green, red) + sum(rgb.second, blue, green, red);
+            return static_cast<uint8_t>((both >> 1) + 128);
+        };
+        *target.y.first = luma(rgb.first);
+        *target.y.second = luma(rgb.second);
+        *target.u = average(Form::kCbBlueWeight, Form::kCbGreenWeight, 0);
+        *target.v = average(Form::kCrBlueWeight, Form::kCrGreenWeight, Form::kCrSum);
+    }
+
     template <class Format, class Form, To420 RowKernels::*kKernel>
     [[gnu::flatten]] static void RgbTo420(Planes420 target, Rows rgb, Size size) {
         if (size.width < kPixels)
             return (V::Lower().*kKernel)(target, rgb, size);
-        ForRowPairs(target, rgb, size.height,
-                    [&](const PlanesPair& to, RowPair from, ptrdiff_t row0, ptrdiff_t row1) {
-                        ForBlocks(
-                            size.width, kPixels,
-                            [&](ptrdiff_t x) {
-                                RgbBlockTo420<Format, Form>(Advance(to, x), Advance(from, Format::kBytes * x),
-                                                            2 * rgb.step, [](RowIndex, const Quads&) {});
-                            },
-                            [&](ptrdiff_t x) {
-                                (kPlainKernels.*kKernel)(target.At(x, row0), rgb.At(row0, Format::kBytes * x),
-                                                         LastColumn(row0, row1));
-                            });
-                    });
+        ForRowPairs(target, rgb, size.height, [&](const PlanesPair& to, RowPair from, ptrdiff_t, ptrdiff_t) {
+            ForBlocks(
+                size.width, kPixels,
+                [&](ptrdiff_t x) {
+                    RgbBlockTo420<Format, Form>(Advance(to, x), Advance(from, Format::kBytes * x),
+                                                2 * rgb.step, [](RowIndex, const Quads&) {});
+                },
+                [&](ptrdiff_t x) {
+                    RgbPixelsTo420<Form>(Advance(to, x), Advance(from, Format::kBytes * x));
+                });
+        });
         V::FinishPicture();
     }
 
@@ -203,8 +225,10 @@ struct LaneFromRgb {
                                                                   2 * bgra.step, storeAlpha);
                             },
                             [&](ptrdiff_t x) {
-                                kPlainKernels.bgra32To420(target.At(x, row0), alpha.At(row0, x),
-                                                          bgra.At(row0, 4 * x), LastColumn(row0, row1));
+                                const RowPair pixels = Advance(from, 4 * x);
+                                alpha[row0][x] = pixels.first[3];
+                                alpha[row1][x] = pixels.second[3];
+                                RgbPixelsTo420<FastRgbForm>(Advance(to, x), pixels);
                             });
                     });
         V::FinishPicture();

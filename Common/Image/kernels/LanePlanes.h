@@ -40,7 +40,7 @@ struct LanePlanes {
             ForBlocks(
                 size.width, blockPixels, [&](ptrdiff_t x) { block(to + x / 2, Advance(from, x)); },
                 [&](ptrdiff_t x) {
-                    kPlainKernels.halve(target.At(half, x / 2), source.At(row0, x), LastColumn(row0, row1));
+                    to[x / 2] = static_cast<uint8_t>((from.first[x] + from.second[x]) >> 1);
                 });
         });
         V::FinishPicture();
@@ -76,7 +76,8 @@ struct LanePlanes {
             ForBlocks(
                 size.width, blockPixels, [&](ptrdiff_t x) { block(Advance(to, 2 * x), from + x); },
                 [&](ptrdiff_t x) {
-                    kPlainKernels.doubled(target.At(2 * row, 2 * x), source.At(row, x), LastColumn(row, row));
+                    to.first[2 * x] = to.first[2 * x + 1] = from[x];
+                    to.second[2 * x] = to.second[2 * x + 1] = from[x];
                 });
         }
         V::FinishPicture();
