@@ -1,6 +1,6 @@
 #include "writer/Encoder.h"
 
-#include "writer/FormatTable.h"
+#include "media/CodeText.h"
 #include "writer/WriterFailure.h"
 #include "writer/WriterStatus.h"
 

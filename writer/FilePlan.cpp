@@ -1,5 +1,6 @@
 #include "writer/FilePlan.h"
 
+#include "media/CodeText.h"
 #include "media/Limits.h"
 #include "media/MediaRecords.h"
 #include "writer/PaletteMaker.h"

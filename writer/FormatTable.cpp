@@ -373,16 +373,6 @@ uint32_t FormatTraits(uint32_t code) {
            (container->kind == ContainerKind::kSteadyRate ? uint32_t{kWriterFormatSteadyRate} : 0U);
 }
 
-std::string CodeText(uint32_t code) {
-    std::string text(4, ' ');
-    for (char& character : text) {
-        const auto byte = static_cast<char>(code & 0xFF);
-        character = byte >= ' ' && byte <= '~' ? byte : '?';
-        code >>= 8;
-    }
-    return text;
-}
-
 const FileFormatInfo* FileFormatInfos() {
     static const auto table = [] {
         std::array<FileFormatInfo, kContainers.size() + 1> entries{}; // what is not filled ends the table

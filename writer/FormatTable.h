@@ -138,9 +138,6 @@ const Carriage& FindCarriage(const Container& container, AVCodecID soundCodec);
 /// kWriterFormat... of the format; 0 when the code is not in the table.
 uint32_t FormatTraits(uint32_t code);
 
-/// The four characters of a code, for messages.
-std::string CodeText(uint32_t code);
-
 /// The table for hosts, ended by an entry with code 0; only what this FFmpeg build can encode.
 const FileFormatInfo* FileFormatInfos();
 

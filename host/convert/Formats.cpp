@@ -1,5 +1,6 @@
 #include "host/convert/Formats.h"
 
+#include "media/CodeText.h"
 #include "media/FourCC.h"
 #include "media/MediaWriter.h"
 #include "writer/WriterStatus.h"
@@ -82,9 +83,7 @@ std::optional<QualityScale> QualityScaleOf(uint32_t videoCodec) {
 }
 
 std::string CodeName(uint32_t code) {
-    std::string name;
-    for (int shift = 0; shift < 32; shift += 8)
-        name += static_cast<char>(code >> shift & 0xFF);
+    const std::string name = CodeText(code);
     return name.substr(0, name.find_last_not_of(' ') + 1);
 }
 

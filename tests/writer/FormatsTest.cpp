@@ -1,5 +1,6 @@
 // Every format with every codec that the table says it carries: written, then read back and decoded.
 #include "MovieReader.h"
+#include "media/CodeText.h"
 #include "tests/support/Folder.h"
 #include "writer/FormatTable.h"
 
@@ -19,7 +20,7 @@ struct Pair {
 std::string Name(const testing::TestParamInfo<Pair>& info) {
     std::string name;
     for (const uint32_t code : {info.param.format, info.param.video, info.param.audio})
-        name += (name.empty() ? "" : "_") + (code == 0 ? "none" : writer::CodeText(code));
+        name += (name.empty() ? "" : "_") + (code == 0 ? "none" : CodeText(code));
     std::erase(name, ' ');
     return name;
 }
