@@ -1,12 +1,11 @@
 #include "host/presets/PresetReader.h"
 
+#include "host/convert/Formats.h"
 #include "host/presets/Notation.h"
 #include "host/presets/Preset.h"
-#include "media/FourCC.h"
 #include "media/Limits.h"
 
 #include <algorithm>
-#include <cctype>
 #include <charconv>
 #include <fmt/format.h>
 #include <functional>
@@ -29,15 +28,6 @@ bool IsLadder(const Json& value) {
     return value.is_object() && !value.empty() &&
            std::all_of(value.items().begin(), value.items().end(),
                        [](const auto& member) { return ParseBound(member.key()).has_value(); });
-}
-
-std::optional<uint32_t> ParseFourCC(const std::string& text) {
-    if (text.empty() || text.size() > 4)
-        return std::nullopt;
-    char code[4] = {' ', ' ', ' ', ' '};
-    std::transform(text.begin(), text.end(), code,
-                   [](char c) { return static_cast<char>(std::toupper(static_cast<unsigned char>(c))); });
-    return FourCC(code[0], code[1], code[2], code[3]);
 }
 
 std::optional<double> AsQuality(const Json& value) {
@@ -65,7 +55,7 @@ std::optional<Size> AsSize(const Json& value) {
 }
 
 std::optional<uint32_t> AsCode(const Json& value) {
-    return value.is_string() ? ParseFourCC(value.get<std::string>()) : std::nullopt;
+    return value.is_string() ? ParseCode(value.get<std::string>()) : std::nullopt;
 }
 
 std::optional<bool> AsFlag(const Json& value) {
@@ -190,7 +180,7 @@ private:
             return;
         }
         for (const auto& [name, figures] : value.items()) {
-            const std::optional<uint32_t> codec = ParseFourCC(name);
+            const std::optional<uint32_t> codec = ParseCode(name);
             if (!codec)
                 Refuse(pointer, kWanted);
             preferences_.quality[*codec] = steps(figures, pointer + "/" + name);
