@@ -45,10 +45,10 @@ std::string Composition(uint32_t number, bool shows) {
     return data;
 }
 
-constexpr const char* kWords = "1\n00:00:00,500 --> 00:00:01,200\nPlain <i>words</i>\n\n"
-                               "2\n00:00:01,400 --> 00:00:02,400\nGr\xC3\xBC\xC3\x9F"
-                               "e, \xD0\xB4\xD0\xB2\xD0\xB0\n";
-constexpr const char* kSigns =
+constexpr const char* kWordsFile = "1\n00:00:00,500 --> 00:00:01,200\nPlain <i>words</i>\n\n"
+                                   "2\n00:00:01,400 --> 00:00:02,400\nGr\xC3\xBC\xC3\x9F"
+                                   "e, \xD0\xB4\xD0\xB2\xD0\xB0\n";
+constexpr const char* kSignsFile =
     "[Script Info]\nScriptType: v4.00+\nPlayResX: 160\nPlayResY: 120\n\n[V4+ Styles]\n"
     "Format: Name, Fontname, Fontsize, PrimaryColour, SecondaryColour, OutlineColour, BackColour, "
     "Bold, Italic, Underline, StrikeOut, ScaleX, ScaleY, Spacing, Angle, BorderStyle, Outline, "
@@ -57,7 +57,7 @@ constexpr const char* kSigns =
     "[Events]\nFormat: Layer, Start, End, Style, Name, MarginL, MarginR, MarginV, Effect, Text\n"
     "Dialogue: 0,0:00:00.30,0:00:01.50,Default,,0,0,0,,{\\pos(20,20)}A sign\n"
     "Dialogue: 1,0:00:01.00,0:00:02.00,Default,Anna,0,0,0,,{\\b1}Bold{\\b0} and plain\n";
-constexpr const char* kNotes =
+constexpr const char* kNotesFile =
     ";FFMETADATA1\ntitle=The whole\nartist=Nobody & S\xC3\xB6hne\nalbum=Collected\n"
     "album_artist=All\ndate=2021-05-04\ncomment=Said \\= so\\; it\\#s\ndescription=Long text\n"
     "genre=Test\ncomposer=One\ncopyright=Free\ncreation_time=2021-05-04T10:11:12.000000Z\n"
@@ -73,12 +73,12 @@ Args Texts() {
     const std::string dvd = test_movies::Make("dvd.mkv", Join(bits, Words("-c:s dvdsub")));
     const std::string dvb =
         test_movies::Make("dvb.ts", Join(bits, Words("-c:s dvbsub -muxdelay 0 -muxpreload 0")));
-    return {"-i", Part("words.srt", kWords),
-            "-i", Part("signs.ass", kSigns),
+    return {"-i", Part("words.srt", kWordsFile),
+            "-i", Part("signs.ass", kSignsFile),
             "-i", bits.back(),
             "-i", dvd,
             "-i", dvb,
-            "-i", Part("notes.txt", kNotes)};
+            "-i", Part("notes.txt", kNotesFile)};
 }
 
 /// -OPTION:KIND:NUMBER VALUE for each of `values` that is not empty.
