@@ -58,8 +58,9 @@ TEST(UnusualPictures, WhatTheyLoseIsTold) {
         };
         EXPECT_EQ(tells("transparency"), test.transparent) << result.err;
         EXPECT_EQ(tells("(4:2:0)"), test.colours != nullptr) << result.err;
-        if (test.colours)
+        if (test.colours) {
             EXPECT_TRUE(tells(std::string("its ") + test.colours + " pictures")) << result.err;
+        }
     }
 }
 
