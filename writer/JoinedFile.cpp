@@ -257,8 +257,8 @@ void JoinedFile::TakeTotals(const PieceTotals& totals, bool rest) {
         }
         status.llSamplesReceived = totals.samplesReceived;
         status.llSamplesWritten = totals.samplesWritten;
-        status.dVideoReceived = static_cast<double>(totals.videoReceived) / kMicroseconds;
-        status.dAudioReceived = static_cast<double>(totals.audioReceived) / kMicroseconds;
+        status.dVideoReceived = static_cast<double>(totals.videoReceived) / kTotalsPerSecond;
+        status.dAudioReceived = static_cast<double>(totals.audioReceived) / kTotalsPerSecond;
         status.nSampleRate = static_cast<int32_t>(totals.sampleRate);
         status.nAudioBitrate = static_cast<int32_t>(totals.audioBitrate);
     });

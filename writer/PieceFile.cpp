@@ -206,8 +206,8 @@ void PieceWriter::WriteTrailer() {
     avio_w8(&io, kEnd);
     for (const int64_t number :
          {status.llPicturesReceived, status.llPicturesWritten, status.llSamplesReceived,
-          status.llSamplesWritten, int64_t{std::llround(status.dVideoReceived * kMicroseconds)},
-          int64_t{std::llround(status.dAudioReceived * kMicroseconds)}, int64_t{status.nSampleRate},
+          status.llSamplesWritten, int64_t{std::llround(status.dVideoReceived * kTotalsPerSecond)},
+          int64_t{std::llround(status.dAudioReceived * kTotalsPerSecond)}, int64_t{status.nSampleRate},
           int64_t{status.nAudioBitrate}})
         Put(io, number);
 }

@@ -23,7 +23,7 @@
 
 namespace writer {
 
-constexpr int64_t kMicroseconds = 1'000'000; ///< Of the times in a piece's totals, in a second.
+constexpr int64_t kTotalsPerSecond = 10'000'000; ///< Of the times in a piece's totals, media time.
 
 /// Writes one. The totals at its end are those of `record`, which outlives it.
 class PieceWriter final : public PacketWriter {
@@ -63,7 +63,7 @@ struct PieceTotals {
     int64_t picturesWritten = 0;
     int64_t samplesReceived = 0;
     int64_t samplesWritten = 0;
-    int64_t videoReceived = 0; ///< Microseconds.
+    int64_t videoReceived = 0; ///< kTotalsPerSecond in a second.
     int64_t audioReceived = 0;
     int64_t sampleRate = 0;
     int64_t audioBitrate = 0;
