@@ -52,6 +52,14 @@ std::string WhySubtitlesStay(const StreamInfo& stream, const FileFormatInfo& for
     return fmt::format("{} cannot hold them{}", ShortName(format), matroskaCan ? ", MKV can" : "");
 }
 
+/// What an output loses of a file of subtitles that holds this stream.
+std::optional<NotCarried> LostOfFile(const StreamInfo& stream, const Request& request,
+                                     const FileFormatInfo& format) {
+    if (std::string reason = WhySubtitlesStay(stream, format); !reason.empty())
+        return NotCarried{"subtitles", std::nullopt, stream.codec, stream.language, std::move(reason)};
+    return LostLabel(stream, request, format);
+}
+
 /// What `read` gives, with its errors as failures.
 template <class Function>
 auto& OpenedBeside(Function read) {
@@ -86,7 +94,7 @@ public:
         tracks_.push_back({track, &movie_.ReadSoundBeside(stream.index), stream});
     }
 
-    /// Returns why not, or nothing.
+    /// Returns what of it is lost.
     std::optional<NotCarried> AddFile(const SubtitleFileWish& wish, const std::string& charset) {
         const AVStream* described = nullptr;
         BesidePackets& source = OpenedBeside(
@@ -95,12 +103,12 @@ public:
         stream.kind = StreamKind::kSubtitles;
         stream.codec = avcodec_get_name(described->codecpar->codec_id);
         stream.language = ThreeLetters(wish.language);
-        if (std::string reason = WhySubtitlesStay(stream, format_); !reason.empty())
-            return NotCarried{"subtitles", std::nullopt, stream.codec, stream.language, std::move(reason)};
-        WriterTrack track{};
-        track.pParameters = described->codecpar;
-        tracks_.push_back({track, &source, stream});
-        return std::nullopt;
+        if (WhySubtitlesStay(stream, format_).empty()) {
+            WriterTrack track{};
+            track.pParameters = described->codecpar;
+            tracks_.push_back({track, &source, stream});
+        }
+        return LostOfFile(stream, request_, format_);
     }
 
     void AddPackets(const StreamInfo& stream) {
@@ -122,8 +130,7 @@ public:
             each.track.pContext = each.source;
             if (MWAddTrack(set_, &each.track) == 0)
                 throw std::bad_alloc();
-            if (std::optional<NotCarried> lost = LabelTrack(each.stream, request_, format_, set_, number++))
-                carried.left.push_back(std::move(*lost));
+            LabelTrack(each.stream, request_, format_, set_, number++);
         }
     }
 
@@ -265,6 +272,41 @@ Chosen ChosenOf(const SourceInfo& source, const Request& request) {
             SubtitlesToCarry(source, request)};
 }
 
+/// What goes into the output beside what the engine converts.
+std::vector<int> StreamsBeside(const SourceInfo& source, const Chosen& chosen, const Request& request,
+                               const FileFormatInfo& format) {
+    std::vector<int> beside;
+    if (request.copySound && source.sound && format.bHasAudio != 0)
+        beside.push_back(source.sound->index);
+    for (const int stream : FurtherSound(source, request, format))
+        beside.push_back(stream);
+    for (const int stream : chosen.subtitles)
+        if (WhySubtitlesStay(StreamAt(source, stream), format).empty())
+            beside.push_back(stream);
+    return beside;
+}
+
+/// Texts, labels and chapters that the format has no room for.
+std::vector<NotCarried> LostByFormat(const SourceInfo& source, const std::vector<int>& beside,
+                                     const Request& request, const FileFormatInfo& format) {
+    std::vector<NotCarried> left = LostTexts(source, request, format);
+    if (std::optional<NotCarried> chapters = WhyChaptersStay(source, request, format))
+        left.push_back(*std::move(chapters));
+    else if (!request.noChapters && source.unreadChapters > 0)
+        left.push_back(
+            {"chapters",
+             std::nullopt,
+             {},
+             {},
+             fmt::format("{} of them are in other editions or within others", source.unreadChapters)});
+    if (std::optional<NotCarried> timecode = WhyTimecodeStays(source, request, format))
+        left.push_back(*std::move(timecode));
+    for (const int stream : beside)
+        if (std::optional<NotCarried> lost = LostLabel(StreamAt(source, stream), request, format))
+            left.push_back(std::move(*lost));
+    return left;
+}
+
 } // namespace
 
 std::vector<int> FurtherSound(const SourceInfo& source, const Request& request,
@@ -281,36 +323,26 @@ std::vector<int> FurtherSound(const SourceInfo& source, const Request& request,
 
 Carried CarryOver(Movie& movie, const Request& request, const FileFormatInfo& format, uint32_t writerSet) {
     const SourceInfo& source = movie.Info();
-    Carried carried{{}, CarryTexts(source, request, format, writerSet)};
+    const Chosen chosen = ChosenOf(source, request);
+    const std::vector<int> beside = StreamsBeside(source, chosen, request, format);
+    CarryTexts(source, request, format, writerSet);
+    Carried carried{{}, LostByFormat(source, beside, request, format)};
     std::vector<NotCarried>& left = carried.left;
-    if (std::optional<NotCarried> chapters = WhyChaptersStay(source, request, format))
-        left.push_back(*std::move(chapters));
-    else if (!request.noChapters) {
-        if (source.unreadChapters > 0)
-            left.push_back(
-                {"chapters",
-                 std::nullopt,
-                 {},
-                 {},
-                 fmt::format("{} of them are in other editions or within others", source.unreadChapters)});
+    if (!request.noChapters && !WhyChaptersStay(source, request, format))
         if (const int wrong = CarryChapters(source, request, format, writerSet); wrong != 0)
             left.push_back(
                 {"chapters", std::nullopt, {}, {}, fmt::format("{} of them have no length", wrong)});
-    }
-    if (std::optional<NotCarried> timecode = WhyTimecodeStays(source, request, format))
-        left.push_back(*std::move(timecode));
     FurtherTracks tracks(movie, request, format, writerSet);
-    if (request.copySound && source.sound && format.bHasAudio != 0)
-        tracks.AddSound(StreamAt(source, source.sound->index));
-    for (const int stream : FurtherSound(source, request, format))
-        tracks.AddSound(StreamAt(source, stream));
-    const Chosen chosen = ChosenOf(source, request);
-    for (const int stream : chosen.subtitles)
-        if (WhySubtitlesStay(StreamAt(source, stream), format).empty())
-            tracks.AddPackets(StreamAt(source, stream));
+    for (const int number : beside) {
+        const StreamInfo& stream = StreamAt(source, number);
+        if (stream.kind == StreamKind::kSound)
+            tracks.AddSound(stream);
+        else
+            tracks.AddPackets(stream);
+    }
     for (const SubtitleFileWish& wish : request.subtitleFiles)
-        if (std::optional<NotCarried> stays = tracks.AddFile(wish, request.subtitleCharset))
-            left.push_back(std::move(*stays));
+        if (std::optional<NotCarried> lost = tracks.AddFile(wish, request.subtitleCharset))
+            left.push_back(std::move(*lost));
     tracks.Finish(carried);
     bool hasCover = false;
     for (const StreamInfo& stream : source.streams) {
@@ -337,37 +369,23 @@ std::vector<NotCarried> LostCues(const std::vector<Carried::Subtitles>& subtitle
 
 std::vector<NotCarried> ForetellLeftBehind(const SourceInfo& source, const Request& request,
                                            const FileFormatInfo& format) {
-    SourceChoice choice;
-    choice.pictures = !request.noVideo;
-    choice.sound = !request.noAudio;
-    choice.soundTracks = request.audioTracks;
-    try {
-        Chosen chosen = ChosenOf(source, request);
-        const ChosenStreams streams = ChooseStreams(source.streams, choice);
-        chosen.pictures = streams.pictures;
-        chosen.sound = streams.sound;
-        std::vector<NotCarried> left;
-        if (std::optional<NotCarried> chapters = WhyChaptersStay(source, request, format))
-            left.push_back(*std::move(chapters));
-        if (std::optional<NotCarried> timecode = WhyTimecodeStays(source, request, format))
-            left.push_back(*std::move(timecode));
-        for (const StreamInfo& stream : source.streams)
-            if (chosen.Wants(stream))
-                if (std::string reason = WhyItStays(source, chosen, stream, format, request.copySound);
-                    !reason.empty())
-                    left.push_back(LeftOf(stream, std::move(reason)));
-        for (const SubtitleFileWish& wish : request.subtitleFiles) {
-            StreamInfo stream;
-            stream.kind = StreamKind::kSubtitles;
-            stream.codec = UsualTextCodec(wish.path);
-            if (std::string reason = WhySubtitlesStay(stream, format); !reason.empty())
-                left.push_back({"subtitles", std::nullopt, stream.codec, ThreeLetters(wish.language),
-                                std::move(reason)});
-        }
-        return left;
-    } catch (const SourceError& error) {
-        throw Failure(Category::kRequest, error.what());
+    const Chosen chosen = ChosenOf(source, request);
+    std::vector<NotCarried> left =
+        LostByFormat(source, StreamsBeside(source, chosen, request, format), request, format);
+    for (const SubtitleFileWish& wish : request.subtitleFiles) {
+        StreamInfo stream;
+        stream.kind = StreamKind::kSubtitles;
+        stream.codec = UsualTextCodec(wish.path);
+        stream.language = ThreeLetters(wish.language);
+        if (std::optional<NotCarried> lost = LostOfFile(stream, request, format))
+            left.push_back(std::move(*lost));
     }
+    for (const StreamInfo& stream : source.streams)
+        if (chosen.Wants(stream))
+            if (std::string reason = WhyItStays(source, chosen, stream, format, request.copySound);
+                !reason.empty())
+                left.push_back(LeftOf(stream, std::move(reason)));
+    return left;
 }
 
 } // namespace movieconv

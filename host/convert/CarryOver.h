@@ -32,9 +32,8 @@ Carried CarryOver(Movie& movie, const Request& request, const FileFormatInfo& fo
 /// Those of the subtitles of which some texts could not be converted. Once the files are closed.
 std::vector<NotCarried> LostCues(const std::vector<Carried::Subtitles>& subtitles, uint32_t writerSet);
 
-/// What CarryOver is going to leave behind of a source that was looked at, whatever was chosen then. Opens no
-/// file: covers and texts that turn out to be of no use are not among it. Throws Failure when a track that is
-/// asked for is not there.
+/// What CarryOver is going to leave behind of a source as AsAskedFor gives it. Opens no file: covers and
+/// chapters that turn out to be of no use are not among it.
 std::vector<NotCarried> ForetellLeftBehind(const SourceInfo& source, const Request& request,
                                            const FileFormatInfo& format);
 

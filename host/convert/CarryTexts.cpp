@@ -56,6 +56,32 @@ std::vector<Tag> TextsFor(const SourceInfo& source, const Request& request) {
     return texts;
 }
 
+/// What the engine converts, with the writer's numbers for it.
+std::vector<std::pair<const StreamInfo*, int>> EnginesTracks(const SourceInfo& source, const Request& request,
+                                                             const FileFormatInfo& format) {
+    std::vector<std::pair<const StreamInfo*, int>> tracks;
+    const auto add = [&](int stream, int track) {
+        tracks.emplace_back(&source.streams[static_cast<std::size_t>(stream)], track);
+    };
+    if (source.pictures && !request.noVideo && format.bHasVideo != 0)
+        add(source.pictures->index, kWriterTrackPictures);
+    if (source.sound && !request.noAudio && !request.copySound && format.bHasAudio != 0)
+        add(source.sound->index, kWriterTrackSound);
+    return tracks;
+}
+
+/// The stream's language by a code that the format can hold; empty when there is none.
+std::string LanguageIn(const FileFormatInfo& format, const StreamInfo& stream) {
+    // Transport streams tell the language of sound and subtitles only.
+    const bool hasNone = stream.kind == StreamKind::kPictures && format.fccFormat == FourCC("TS  ");
+    if (stream.language.empty() || hasNone)
+        return {};
+    for (const std::string& code : CodesFor(stream.language))
+        if (MWCarriesTrackTag(format.fccFormat, "language", code.c_str()) != 0)
+            return code;
+    return {};
+}
+
 /// How many chapters were left out, because they make no sense.
 int AddChapters(const SourceInfo& source, uint32_t set) {
     int left = 0;
@@ -95,37 +121,30 @@ int AddChapterTexts(const SourceInfo& source, const Request& request, uint32_t s
 
 } // namespace
 
-std::optional<NotCarried> LabelTrack(const StreamInfo& stream, const Request& request,
-                                     const FileFormatInfo& format, uint32_t set, int track) {
-    std::vector<std::string> missing;
-    // Transport streams tell the language of sound and subtitles only.
-    const bool hasLanguage = track != kWriterTrackPictures || format.fccFormat != FourCC("TS  ");
-    const auto carries = [&](std::string_view key, const std::string& value) {
-        return (hasLanguage || key != "language") &&
-               MWCarriesTrackTag(format.fccFormat, key.data(), value.c_str()) != 0;
-    };
-    if (!stream.language.empty()) {
-        const std::vector<std::string> codes = CodesFor(stream.language);
-        const auto code = std::find_if(codes.begin(), codes.end(),
-                                       [&](const std::string& each) { return carries("language", each); });
-        if (code != codes.end())
-            MWSetTrackTag(set, track, "language", code->c_str());
-        else
-            missing.emplace_back("language");
-    }
-    if (!stream.languageTag.empty()) {
+void LabelTrack(const StreamInfo& stream, const Request& request, const FileFormatInfo& format, uint32_t set,
+                int track) {
+    if (const std::string code = LanguageIn(format, stream); !code.empty())
+        MWSetTrackTag(set, track, "language", code.c_str());
+    if (!stream.languageTag.empty())
         MWSetTrackTag(set, track, "language_tag", stream.languageTag.c_str());
-        if (!carries("language_tag", stream.languageTag) && missing.empty())
-            missing.push_back(fmt::format("language as {}", stream.languageTag));
-    }
-    if (!request.noMetadata && !stream.title.empty()) {
+    if (!request.noMetadata && !stream.title.empty())
         MWSetTrackTag(set, track, "title", stream.title.c_str());
-        if (!carries("title", stream.title))
-            missing.emplace_back("title");
-    }
-    const int flags = Dispositions(stream.flags);
-    MWSetTrackFlags(set, track, flags);
-    if ((flags & ~(MWCarriedTrackFlags(format.fccFormat) | AV_DISPOSITION_DEFAULT)) != 0)
+    MWSetTrackFlags(set, track, Dispositions(stream.flags));
+}
+
+std::optional<NotCarried> LostLabel(const StreamInfo& stream, const Request& request,
+                                    const FileFormatInfo& format) {
+    std::vector<std::string> missing;
+    if (!stream.language.empty() && LanguageIn(format, stream).empty())
+        missing.emplace_back("language");
+    else if (!stream.languageTag.empty() &&
+             MWCarriesTrackTag(format.fccFormat, "language_tag", stream.languageTag.c_str()) == 0)
+        missing.push_back(fmt::format("language as {}", stream.languageTag));
+    if (!request.noMetadata && !stream.title.empty() &&
+        MWCarriesTrackTag(format.fccFormat, "title", stream.title.c_str()) == 0)
+        missing.emplace_back("title");
+    const int carried = MWCarriedTrackFlags(format.fccFormat) | AV_DISPOSITION_DEFAULT;
+    if ((Dispositions(stream.flags) & ~carried) != 0)
         missing.emplace_back("flags");
     if (missing.empty())
         return std::nullopt;
@@ -134,30 +153,30 @@ std::optional<NotCarried> LabelTrack(const StreamInfo& stream, const Request& re
                       fmt::format("{} cannot hold its {}", ShortName(format), Enumerate(missing))};
 }
 
-std::vector<NotCarried> CarryTexts(const SourceInfo& source, const Request& request,
-                                   const FileFormatInfo& format, uint32_t set) {
+void CarryTexts(const SourceInfo& source, const Request& request, const FileFormatInfo& format,
+                uint32_t set) {
+    for (const Tag& tag : TextsFor(source, request))
+        MWSetTag(set, tag.key.c_str(), tag.value.c_str());
+    for (const auto& [stream, track] : EnginesTracks(source, request, format))
+        LabelTrack(*stream, request, format, set, track);
+}
+
+std::vector<NotCarried> LostTexts(const SourceInfo& source, const Request& request,
+                                  const FileFormatInfo& format) {
     std::vector<NotCarried> left;
     std::vector<std::string> missing;
-    for (const Tag& tag : TextsFor(source, request)) {
-        MWSetTag(set, tag.key.c_str(), tag.value.c_str());
+    for (const Tag& tag : TextsFor(source, request))
         if (!tag.value.empty() && MWCarriesTag(format.fccFormat, tag.key.c_str(), tag.value.c_str()) == 0)
             missing.push_back(tag.key);
-    }
     if (!missing.empty())
         left.push_back({"tags",
                         std::nullopt,
                         {},
                         {},
                         fmt::format("{} cannot hold {}", ShortName(format), Enumerate(missing))});
-    const auto label = [&](int stream, int track) {
-        if (std::optional<NotCarried> lost =
-                LabelTrack(source.streams[static_cast<std::size_t>(stream)], request, format, set, track))
+    for (const auto& [stream, track] : EnginesTracks(source, request, format))
+        if (std::optional<NotCarried> lost = LostLabel(*stream, request, format))
             left.push_back(std::move(*lost));
-    };
-    if (source.pictures && !request.noVideo && format.bHasVideo != 0)
-        label(source.pictures->index, kWriterTrackPictures);
-    if (source.sound && !request.noAudio && !request.copySound && format.bHasAudio != 0)
-        label(source.sound->index, kWriterTrackSound);
     return left;
 }
 

@@ -14,14 +14,20 @@
 
 namespace movieconv {
 
-/// Gives the writer's set the texts about the movie and what the engine's tracks are called. Returns what the
-/// format cannot hold.
-std::vector<NotCarried> CarryTexts(const SourceInfo& source, const Request& request,
-                                   const FileFormatInfo& format, uint32_t set);
+/// Gives the writer's set the texts about the movie and what the engine's tracks are called.
+void CarryTexts(const SourceInfo& source, const Request& request, const FileFormatInfo& format, uint32_t set);
 
-/// Says what a track of the writer's set is, as far as the format can. Returns what it cannot.
-std::optional<NotCarried> LabelTrack(const StreamInfo& stream, const Request& request,
-                                     const FileFormatInfo& format, uint32_t set, int track);
+/// What of these the format cannot hold.
+std::vector<NotCarried> LostTexts(const SourceInfo& source, const Request& request,
+                                  const FileFormatInfo& format);
+
+/// Says what a track of the writer's set is, as far as the format can.
+void LabelTrack(const StreamInfo& stream, const Request& request, const FileFormatInfo& format, uint32_t set,
+                int track);
+
+/// What of that the format cannot say; nothing when it can say all.
+std::optional<NotCarried> LostLabel(const StreamInfo& stream, const Request& request,
+                                    const FileFormatInfo& format);
 
 /// Gives the writer's set the chapters, for a format that holds some. Returns how many were left out, because
 /// they make no sense.

@@ -5,7 +5,9 @@
 #include "host/convert/Failure.h"
 #include "host/source/CropDetection.h"
 #include "host/source/MediaTime.h"
+#include "host/source/StreamChoice.h"
 
+#include <cstddef>
 #include <utility>
 
 namespace movieconv {
@@ -85,6 +87,26 @@ Movie OpenMovie(const Request& request, std::shared_ptr<Interruption> interrupti
 
 SourceInfo LookAtSource(const Request& request) {
     return Opened([&] { return Source(request.input, CroppedChoiceOf(request, nullptr)).Info(); });
+}
+
+SourceInfo AsAskedFor(SourceInfo source, const Request& request) {
+    const ChosenStreams chosen = Opened([&] {
+        WantedTracks(source.streams, StreamKind::kSubtitles, request.subtitles);
+        BurnWish wish;
+        wish.what = request.burnSubtitles;
+        if (NamesStream(wish))
+            WantedTracks(source.streams, StreamKind::kSubtitles, {{request.burnSubtitles}});
+        return ChooseStreams(source.streams, ChoiceOf(request));
+    });
+    const auto choose = [&](auto& now, int number, auto StreamInfo::*told) {
+        if (number < 0)
+            now.reset();
+        else if (!now || now->index != number)
+            now = source.streams[static_cast<std::size_t>(number)].*told;
+    };
+    choose(source.pictures, chosen.pictures, &StreamInfo::pictures);
+    choose(source.sound, chosen.sound, &StreamInfo::sound);
+    return source;
 }
 
 } // namespace movieconv

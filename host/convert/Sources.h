@@ -16,6 +16,11 @@ Movie OpenMovie(const Request& request,
 /// What it holds. Throws Failure.
 SourceInfo LookAtSource(const Request& request);
 
+/// A source that was looked at, whatever was chosen then, with the pictures and the sound that the request
+/// chooses. Of others than before there is only what the container tells. Throws Failure when a track that is
+/// asked for is not there.
+SourceInfo AsAskedFor(SourceInfo source, const Request& request);
+
 } // namespace movieconv
 
 #endif

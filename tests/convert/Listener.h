@@ -21,6 +21,7 @@ public:
     std::vector<std::string> opened;
     std::vector<std::string> closed;
     std::vector<movieconv::Warning> warnings;
+    std::vector<movieconv::NotCarried> left;
     std::vector<std::shared_ptr<const movieconv::ShownPicture>> pictures;
     std::vector<std::thread::id> threads; // one for each of the above
 
@@ -47,6 +48,10 @@ public:
     }
     void Warned(const movieconv::Warning& news) override {
         warnings.push_back(news);
+        Note();
+    }
+    void LeftBehind(const movieconv::NotCarried& news) override {
+        left.push_back(news);
         Note();
     }
     void Showed(const std::shared_ptr<const movieconv::ShownPicture>& news) override {
