@@ -46,6 +46,7 @@ struct Preferences {
     std::optional<uint32_t> format;    ///< Four-character code, for outputs without an extension.
     std::vector<uint32_t> videoCodecs; ///< The first that the format carries. Empty: the engine's choice.
     std::vector<uint32_t> audioCodecs;
+    bool copySound = false; ///< Sound stays as it is coded, unless a request changes it.
 
     /// By codec, by the height of the picture; see Request::quality.
     std::map<uint32_t, Steps<double>> quality;

@@ -208,12 +208,19 @@ private:
              {"leave_out", Taking(into.noVideo, &AsFlag, "true or false")}});
     }
 
+    /// The codec may be "copy", which is no code: sound stays as it is.
+    void TakeSoundCodec(const Json& value, const std::string& pointer) {
+        preferences_.copySound = value == "copy";
+        if (!preferences_.copySound)
+            TakingCodecs(preferences_.audioCodecs)(value, pointer);
+    }
+
     void TakeAudio(const Json& value, const std::string& pointer) {
         constexpr const char* kRate = "a bit rate such as \"160k\", or such rates by number of channels";
         Preferences& into = preferences_;
         TakeMembers(
             value, pointer,
-            {{"codec", TakingCodecs(into.audioCodecs)},
+            {{"codec", [this](const Json& codec, const std::string& at) { TakeSoundCodec(codec, at); }},
              {"rate",
               [&](const Json& rates, const std::string& at) {
                   into.audioRate = AsSteps<int32_t>(rates, at, &AsRate, kRate);

@@ -19,6 +19,12 @@ namespace {
 
 constexpr std::chrono::seconds kPreviewInterval{1};
 
+/// Whether options say what the sound is to become.
+bool ChangesSound(const Request& request) {
+    return request.audioCodec || request.channels || request.sampleRate || request.audioRate ||
+           request.audioMaxRate || request.maxSize;
+}
+
 /// What the preset says, where the other options do not say otherwise.
 void ApplyPreset(Options& options) {
     try {
@@ -27,6 +33,7 @@ void ApplyPreset(Options& options) {
         request.noVideo = request.noVideo || (preset.preferences.noVideo && !request.videoCodec);
         request.noAudio =
             request.noAudio || (preset.preferences.noAudio && !request.audioCodec && !request.copySound);
+        request.copySound = request.copySound || (preset.preferences.copySound && !ChangesSound(request));
         request.preferences = std::move(preset.preferences);
         options.complaints = std::move(preset.complaints);
     } catch (const PresetError& error) {

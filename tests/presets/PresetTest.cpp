@@ -73,6 +73,8 @@ TEST_F(Presets, HoldWhatDiffersFromTheirParents) {
     Own("again", R"({"parent": "rated", "video": {"codec": "h264", "quality": {"0": 21, "1000": 25}}})");
     Own("standard", R"({"video": {"speed": "slowest"}})"); // its parent is the program's
     Own("plain", "{}");
+    Own("kept", R"({"audio": {"codec": "copy"}})");
+    Own("converted", R"({"parent": "kept", "audio": {"codec": ["OPUS", "AAC"]}})");
     fs::create_directory(Path("below"));
     WriteFile(Path("below/file.json"), R"({"parent": "../mine.json", "format": "mkv"})");
 
@@ -95,12 +97,17 @@ TEST_F(Presets, HoldWhatDiffersFromTheirParents) {
     EXPECT_EQ(again.videoCodecs, std::vector<uint32_t>{kH264});
 
     EXPECT_EQ(LoadPreset("plain").preferences.speed, Speed::kSlowest);
+    EXPECT_FALSE(LoadPreset("plain").preferences.copySound);
+    EXPECT_TRUE(LoadPreset("kept").preferences.copySound);
+    const Preferences converted = LoadPreset("converted").preferences;
+    EXPECT_FALSE(converted.copySound);
+    EXPECT_EQ(converted.audioCodecs.size(), 2u);
     EXPECT_EQ(LoadPreset("standard").preferences.quality.at(kH264).At(2), 20);
     EXPECT_EQ(LoadPreset(Path("below/file.json")).preferences.quality.at(kHevc).At(2), 30.5);
     EXPECT_EQ(LoadPreset(Path("below/file.json")).preferences.format, FourCC("MKV "));
 
     const std::vector<PresetSummary> list = ListPresets();
-    ASSERT_EQ(list.size(), 14u);
+    ASSERT_EQ(list.size(), 16u);
     EXPECT_EQ(list[9].name, "again");
     EXPECT_EQ(list[9].path, Path("again.json"));
 }

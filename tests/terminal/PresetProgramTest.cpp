@@ -144,6 +144,12 @@ TEST(ProgramPresets, AreTheStandardAndGiveWayToOptions) {
         EXPECT_EQ(result.code, 0) << result.err;
         return fs::file_size(folder / "o.mkv");
     };
+    WriteFile(folder / "kept.json", R"({"audio": {"codec": "copy"}})");
+    for (const auto& [option, codec] : {std::pair{"--no-chapters", "flac"}, {"--channels=1", "aac"}}) {
+        const std::string output = folder / "sound.mkv";
+        ASSERT_EQ(Call({"-y", "--preset", folder / "kept.json", option, Grainy(), output, "-q"}).code, 0);
+        EXPECT_EQ(movieconv::Movie(output, {}).Info().sound->codec, codec);
+    }
     EXPECT_GT(size({"--quality", "18"}), size({"--quality", "30"}));
     EXPECT_LT(size({"--video-rate", "100k"}), size({}));
     EXPECT_NE(size({"--speed", "slow"}), size({"--speed", "fastest"}));
