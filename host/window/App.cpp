@@ -71,7 +71,8 @@ void App::OnWorkEnded(const Totals& totals) {
                              ? tr("%n movies were converted.", "", totals.done)
                              : tr("%n movies were converted.", "", totals.done) + QLatin1Char(' ') +
                                    tr("%n could not be converted.", "", totals.failed);
-    notifier_.Notify(totals.failed == 0 ? tr("Conversion done") : tr("Conversion done, with failures"), text);
+    notifier_.Notify(totals.failed == 0 ? tr("Conversion done") : tr("Conversion done, with failures"), text,
+                     atEnd.sound);
     QApplication::alert(&window_);
     if (atEnd.sound)
         QApplication::beep();

@@ -1,5 +1,6 @@
 // What is dropped, and what the files are called.
 #include "host/window/model/Intake.h"
+#include "host/window/model/CodecNames.h"
 #include "host/window/model/Naming.h"
 #include "host/window/model/Words.h"
 #include "tests/support/Folder.h"
@@ -100,6 +101,33 @@ TEST(Clock, IsReadAndWritten) {
                                                                           {"1e99", std::nullopt}};
     for (const auto& [text, seconds] : cases)
         EXPECT_EQ(ParseClock(text), seconds) << text.toStdString();
+}
+
+TEST(Range, HoldsWhatMakesSense) {
+    Wishes wishes;
+    SetEnd(wishes, 50, 60);
+    SetBegin(wishes, 70, 60);
+    EXPECT_EQ(wishes.begin, 0);
+    SetBegin(wishes, 20, 60);
+    EXPECT_EQ(wishes.begin, 20);
+    EXPECT_EQ(wishes.end, 50);
+    for (const std::optional<double> end :
+         {std::optional(10.0), std::optional(60.0), std::optional<double>()}) {
+        SetEnd(wishes, end, 60);
+        EXPECT_FALSE(wishes.end);
+    }
+    SetEnd(wishes, 30, 60);
+    SetBegin(wishes, 40, 60);
+    EXPECT_FALSE(wishes.end);
+}
+
+TEST(Names, AreThosePeopleKnow) {
+    EXPECT_EQ(CodecName("hevc"), "HEVC");
+    EXPECT_EQ(CodecName("pcm_s24le"), "PCM");
+    EXPECT_EQ(CodecName("mov_text"), "timed text");
+    EXPECT_EQ(CodecName("something_new"), "something_new");
+    EXPECT_EQ(ChannelsName("5.1(side)"), "5.1");
+    EXPECT_EQ(ChannelsName("stereo"), "stereo");
 }
 
 TEST(LeftText, IsNoMoreExactThanItCanBe) {

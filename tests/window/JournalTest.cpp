@@ -39,6 +39,8 @@ Entry FullEntry() {
                     .subtitles = QList<int>{},
                     .subtitleFiles = {{"/subs/\xFF.srt", "de"}, {"/subs/b.ass", {}}},
                     .subtitleCharset = "WINDOWS-1251",
+                    .burning = {{}, "/subs/\xFF%.srt"},
+                    .copySound = false,
                     .channels = 1,
                     .deinterlace = Wishes::Deinterlace::kAll,
                     .crop = true,
@@ -81,6 +83,12 @@ TEST(Journal, KeepsEverythingOfAnEntry) {
     EXPECT_EQ(loaded[0].outcome.bytes, entry.outcome.bytes);
     EXPECT_EQ(loaded[0].outcome.position, 88.5);
     EXPECT_EQ(loaded[0].notes, entry.notes);
+    Entry burnt;
+    burnt.source = "/m";
+    burnt.wishes.burning.track = 3;
+    burnt.wishes.copySound = true;
+    Journal(folder / "queue", Ignore).Keep({burnt});
+    EXPECT_EQ(Load(folder / "queue").at(0).wishes, burnt.wishes);
 }
 
 TEST(Journal, BringsBackEachStateAndWhatWasActiveAsInterrupted) {
@@ -111,7 +119,8 @@ TEST(Journal, SetsAsideWhatItCannotRead) {
     }
     const Folder folder;
     WriteFile(folder / "queue", R"({"version":1,"entries":[5,{},{"source":"/a","state":"odd"},
-        {"source":"/b","state":"waiting","wishes":{"quality":"high","height":-3,"begin":"x","sounds":7}}]})");
+        {"source":"/b","state":"waiting","wishes":{"quality":"high","height":-3,"begin":"x","sounds":7,
+        "burnt_track":-2,"burnt_file":5,"copy_sound":"yes"}}]})");
     const std::vector<Entry> loaded = Load(folder / "queue");
     ASSERT_EQ(loaded.size(), 1U);
     EXPECT_EQ(loaded[0].source, "/b");

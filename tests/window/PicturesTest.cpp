@@ -1,14 +1,12 @@
 // Real conversions in the window; with a display, pictures of it for people to look at.
 #include "host/window/App.h"
-#include "host/window/model/Words.h"
 #include "host/window/runner/ConvertRunner.h"
 #include "host/window/widgets/Look.h"
 #include "host/window/widgets/QueueView.h"
 #include "host/window/widgets/RangeStrip.h"
 #include "host/window/widgets/WorkPage.h"
 #include "tests/support/Process.h"
-#include "tests/support/SmallDisk.h"
-#include "tests/support/TestMovies.h"
+#include "tests/window/Holiday.h"
 #include "tests/window/ScriptedRunner.h"
 
 #include <gtest/gtest.h>
@@ -61,15 +59,6 @@ struct PicturesTest : testing::Test {
     }
 };
 
-std::string Holiday() {
-    return test_movies::Make("window-4s.mkv",
-                             {"-f", "lavfi", "-i",
-                              "mandelbrot=s=1280x720:r=25:start_scale=0.6:end_scale=0.01:end_pts=250,"
-                              "format=yuv420p",
-                              "-f", "lavfi", "-i", "sine=440:r=48000", "-t", "4", "-c:v", "libx264",
-                              "-preset", "veryfast", "-c:a", "aac"});
-}
-
 } // namespace
 
 TEST_F(PicturesTest, ConvertsMoviesWithALivePicture) {
@@ -116,124 +105,6 @@ TEST_F(PicturesTest, ConvertsMoviesWithALivePicture) {
     QApplication::processEvents();
     Photograph("dark");
     QApplication::setPalette(OwnPalette(false));
-}
-
-TEST_F(PicturesTest, ConvertsSeveralAtOnceAndStopsThem) {
-    const std::string movie = Holiday();
-    app.TheQueue().SetNaming({QStringLiteral("{name}"), folder.Path()});
-    app.TheQueue().Add(std::vector<std::string>(8, movie));
-    app.TheDispatcher().SetAtOnce(8);
-    AwaitExamined(8);
-    app.TheDispatcher().Start();
-    ASSERT_TRUE(Await([&] {
-        return std::all_of(app.TheQueue().Entries().begin(), app.TheQueue().Entries().end(),
-                           [](const Entry& entry) { return entry.figures.position > 0; });
-    }));
-    app.TheDispatcher().PauseAll();
-    EXPECT_TRUE(Await([&] { return At(7).figures.phase == Phase::kPaused; }));
-    app.TheDispatcher().StopAll();
-    ASSERT_TRUE(AwaitDone());
-    std::set<std::string> targets;
-    for (const Entry& entry : app.TheQueue().Entries()) {
-        EXPECT_EQ(entry.state, State::kStopped) << entry.outcome.sentence.toStdString();
-        EXPECT_TRUE(std::filesystem::exists(entry.target)) << entry.target;
-        targets.insert(entry.target);
-    }
-    EXPECT_EQ(targets.size(), 8U);
-}
-
-TEST_F(PicturesTest, TellsWhatGoesWrongInWords) {
-    const std::string movie = Holiday();
-    app.TheQueue().Add({movie});
-    AwaitExamined(1);
-    app.TheQueue().SetTarget(At(0).id, folder / "there is no such folder/x.mp4");
-    AwaitExamined(1);
-    EXPECT_EQ(At(0).findings.warnings.size(), 1);
-    app.TheDispatcher().Start();
-    ASSERT_TRUE(AwaitDone());
-    EXPECT_EQ(At(0).state, State::kFailed);
-    EXPECT_TRUE(At(0).outcome.sentence.endsWith(QLatin1Char('.')));
-    app.TheQueue().Retry({At(0).id});
-    app.TheQueue().SetTarget(At(0).id, movie);
-    AwaitExamined(1);
-    EXPECT_TRUE(At(0).findings.targetExists);
-    app.TheQueue().SetReplace(At(0).id, true);
-    app.TheDispatcher().Start(); // a source is never replaced by what is made of it
-    ASSERT_TRUE(AwaitDone());
-    EXPECT_EQ(At(0).state, State::kFailed);
-    EXPECT_GT(std::filesystem::file_size(movie), 10'000U);
-}
-
-TEST_F(PicturesTest, CarriesTheTracksThatAreChosen) {
-    const std::string words = test_movies::Part("a.srt", "1\n00:00:00,500 --> 00:00:01,500\nGrüße\n");
-    const std::string movie = test_movies::Make(
-        "window-tracks.mkv",
-        test_movies::Join(
-            test_movies::Lavfi("testsrc2=s=320x180:r=25", "sine=440", "sine=880"),
-            test_movies::Args{"-i", words},
-            test_movies::Words("-map 0 -map 1 -map 2 -map 3 -t 2 -c:v libx264 -preset ultrafast "
-                               "-c:a aac -c:s srt -metadata:s:a:0 language=eng "
-                               "-metadata:s:a:1 language=ger -metadata:s:s:0 language=fre")));
-    app.TheQueue().SetNaming({QStringLiteral("{name}"), folder.Path()});
-    app.TheQueue().Add({movie});
-    AwaitExamined(1);
-    ASSERT_EQ(At(0).facts->sounds.size(), 2U);
-    EXPECT_EQ(TrackLine(At(0).facts->sounds[1]), "German (aac, mono)");
-    EXPECT_TRUE(At(0).findings.notes.isEmpty()) << At(0).findings.notes.join("; ").toStdString();
-
-    Wishes wishes;
-    wishes.format = QStringLiteral("flv"); // holds one sound and no subtitles
-    wishes.subtitleFiles = {{folder / "a.srt", QStringLiteral("de")}};
-    app.TheQueue().SetWishes(At(0).id, wishes);
-    AwaitExamined(1);
-    const QString notes = At(0).findings.notes.join(QLatin1Char('\n'));
-    for (const char* told :
-         {"sound 2 (aac, German)", "subtitles 3 (subrip, French)", "subtitles (subrip, German)"})
-        EXPECT_TRUE(notes.contains(QLatin1String(told))) << notes.toStdString();
-    EXPECT_TRUE(At(0).findings.warnings.isEmpty());
-
-    wishes.format = QStringLiteral("mkv");
-    wishes.sounds = QList<int>{At(0).facts->sounds[1].number};
-    wishes.subtitles = QList<int>{};
-    wishes.title = QStringLiteral("Mine");
-    app.TheQueue().SetWishes(At(0).id, wishes);
-    AwaitExamined(1);
-    EXPECT_TRUE(At(0).findings.notes.isEmpty()) << At(0).findings.notes.join("; ").toStdString();
-    app.TheDispatcher().Start();
-    ASSERT_TRUE(AwaitDone());
-    ASSERT_EQ(At(0).state, State::kDone) << At(0).outcome.sentence.toStdString();
-    const MovieFacts made = runner.Look(At(0).target);
-    ASSERT_EQ(made.sounds.size(), 1U);
-    EXPECT_EQ(made.sounds[0].language, "ger");
-    ASSERT_EQ(made.subtitles.size(), 1U);
-    EXPECT_EQ(made.subtitles[0].language, "ger");
-    EXPECT_EQ(made.title, "Mine");
-
-    app.TheQueue().Retry({At(0).id});
-    wishes.sounds = QList<int>{17}; // the file is another one now
-    wishes.subtitleFiles[0].path = folder / "gone.srt";
-    wishes.depth = 10;
-    wishes.format = QStringLiteral("flv");
-    app.TheQueue().SetWishes(At(0).id, wishes);
-    AwaitExamined(1);
-    EXPECT_EQ(At(0).findings.warnings.size(), 2) << At(0).findings.warnings.join("; ").toStdString();
-}
-
-TEST_F(PicturesTest, KeepsWhatTheDecoderSaysInTheLogOfTheMovie) {
-    std::string movie = ReadFile(Holiday());
-    for (size_t at = movie.size() / 3; at < movie.size() / 3 + 20'000; ++at)
-        movie[at] = static_cast<char>(movie[at] ^ 0x55);
-    WriteFile(folder / "scratched.mkv", movie);
-    app.TheQueue().SetNaming({QStringLiteral("{name}"), folder.Path()});
-    app.TheQueue().Add({folder / "scratched.mkv"});
-    AwaitExamined(1);
-    testing::internal::CaptureStderr();
-    app.TheDispatcher().Start();
-    ASSERT_TRUE(AwaitDone());
-    EXPECT_EQ(testing::internal::GetCapturedStderr(), "");
-    EXPECT_FALSE(At(0).notes.filter(QStringLiteral(" @ 0x")).isEmpty())
-        << "no line of a decoder's in\n"
-        << At(0).notes.join(QLatin1Char('\n')).toStdString();
 }
 
 namespace {
@@ -288,21 +159,4 @@ TEST_F(PicturesTest, ComesBackAfterAKill) {
     ASSERT_TRUE(AwaitDone());
     EXPECT_EQ(At(0).state, State::kDone) << At(0).outcome.sentence.toStdString();
     EXPECT_TRUE(std::filesystem::exists(At(0).target));
-}
-
-TEST_F(PicturesTest, WaitsOnADiskThatIsFullUntilThereIsRoom) {
-    const SmallDisk disk(folder / "disk", "700k");
-    if (!disk.IsThere())
-        GTEST_SKIP() << "no mounts here";
-    app.TheQueue().SetNaming({QStringLiteral("{name}"), folder / "disk"});
-    app.TheQueue().Add({Holiday()});
-    AwaitExamined(1);
-    EXPECT_FALSE(At(0).findings.warnings.isEmpty()) << "the page warns that there is little room";
-    app.TheDispatcher().Start();
-    ASSERT_TRUE(Await([&] { return At(0).figures.phase == Phase::kWaitingForRoom || At(0).IsOver(); }));
-    EXPECT_EQ(At(0).state, State::kActive) << At(0).outcome.sentence.toStdString();
-    ASSERT_TRUE(disk.Grow());
-    ASSERT_TRUE(AwaitDone());
-    EXPECT_EQ(At(0).state, State::kDone) << At(0).outcome.sentence.toStdString();
-    EXPECT_GT(std::filesystem::file_size(At(0).target), 700'000U);
 }

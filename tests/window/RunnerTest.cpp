@@ -1,5 +1,6 @@
 // What the window's runner makes of presets and wishes.
 #include "host/convert/Formats.h"
+#include "host/window/runner/LibraryWords.h"
 #include "host/window/runner/PresetShelf.h"
 #include "host/window/runner/Translation.h"
 #include "tests/support/Folder.h"
@@ -155,6 +156,40 @@ TEST_F(RunnerTest, AsksTheLibraryForTracksAndTexts) {
     EXPECT_EQ(request.depth, 8);
 }
 
+TEST_F(RunnerTest, AsksTheLibraryToCopySoundAndToDrawSubtitles) {
+    Wishes wishes;
+    wishes.copySound = true;
+    wishes.channels = 1;
+    wishes.burning.track = 3;
+    movieconv::Request request = ToRequest(OrderOf(wishes, "out.mkv"));
+    EXPECT_TRUE(request.copySound);
+    EXPECT_FALSE(request.channels) << "they exclude each other";
+    EXPECT_EQ(request.burnSubtitles, "3");
+    wishes.burning = {{}, "/s/a.srt"};
+    EXPECT_EQ(ToRequest(OrderOf(wishes, "out.mkv")).burnSubtitles, "/s/a.srt");
+    EXPECT_EQ(ToRequest(OrderOf(wishes, "out.mp3")).burnSubtitles, "") << "there are no pictures";
+
+    Order order = OrderOf(wishes, "out.mkv");
+    order.facts.width = 0;
+    order.facts.sounds = {{1, {}, {}, {}, 640'000}, {2, {}, {}, {}, 320'000}};
+    EXPECT_EQ(EstimatedRate(order, ToRequest(order)), 960'000);
+    order.wishes.sounds = QList<int>{2};
+    EXPECT_EQ(EstimatedRate(order, ToRequest(order)), 320'000);
+}
+
+TEST(LibraryWords, KnowWhatTheLibrarySays) {
+    movieconv::NotCarried what{"subtitles", 3, "hdmv_pgs_subtitle", "ger", "MP4 cannot hold them, MKV can"};
+    EXPECT_EQ(LineOf(what), "subtitles 3 (Blu-ray (PGS), German): MP4 cannot hold them, MKV can");
+    what = {"tags", std::nullopt, {}, {}, "AVI cannot hold MOOD, KEY and title"};
+    EXPECT_EQ(LineOf(what), "tags: AVI cannot hold MOOD, KEY and title");
+    EXPECT_EQ(SentenceOf("MP4 cannot hold \"pcm_s16le\" sound as it is; MOV, MKV can"),
+              "MP4 cannot hold “PCM” sound as it is; MOV, MKV can.");
+    const std::string odd = "cannot open \"/m/a and b %2, c.mkv\": it is a text, not a movie";
+    EXPECT_EQ(InWindowsLanguage(odd),
+              QStringLiteral("cannot open “/m/a and b %2, c.mkv”: it is a text, not a movie"));
+    EXPECT_EQ(SentenceOf("something new"), "Something new.");
+}
+
 TEST_F(RunnerTest, SavesWishesAsAPresetAndTakesThemBack) {
     Wishes wishes;
     wishes.format = "mkv";
@@ -162,7 +197,9 @@ TEST_F(RunnerTest, SavesWishesAsAPresetAndTakesThemBack) {
     wishes.height = 720;
     wishes.rate = 24;
     wishes.channels = 1;
+    wishes.copySound = true;
     wishes.begin = 30; // of one movie alone
+    wishes.burning.track = 3;
     WritePreset(Own("mine"), wishes);
     EXPECT_EQ(OnShelf("mine").extension, "mkv");
     EXPECT_NEAR(OnShelf("mine").quality, 80, 3);
@@ -170,13 +207,16 @@ TEST_F(RunnerTest, SavesWishesAsAPresetAndTakesThemBack) {
     EXPECT_TRUE(mine.complaints.empty()) << mine.complaints.front();
     EXPECT_EQ(mine.preferences.fitWithin->height, 720);
     EXPECT_EQ(mine.preferences.frameRate, 24);
-    EXPECT_EQ(mine.preferences.channels, 1);
+    EXPECT_TRUE(mine.preferences.copySound && OnShelf("mine").copiesSound);
+    EXPECT_FALSE(mine.preferences.channels) << "the sound's own";
     EXPECT_TRUE(mine.preferences.speed) << "the parent's";
 
     Wishes changed; // and saved under the name of the preset that it changes
     changed.preset = "mine";
     changed.withSound = false;
+    changed.copySound = false;
     WritePreset(Own("mine"), changed);
+    EXPECT_FALSE(movieconv::LoadPreset("mine").preferences.copySound);
     EXPECT_TRUE(movieconv::LoadPreset("mine").preferences.noAudio);
     EXPECT_EQ(movieconv::LoadPreset("mine").preferences.frameRate, 24);
 

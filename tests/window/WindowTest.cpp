@@ -1,142 +1,22 @@
 // Every action of the window, over a scripted runner.
-#include "host/window/App.h"
 #include "host/window/widgets/EntryPage.h"
 #include "host/window/widgets/NamingDialog.h"
-#include "host/window/widgets/NoticeBar.h"
 #include "host/window/widgets/OverPage.h"
-#include "host/window/widgets/QueueView.h"
 #include "host/window/widgets/RangeStrip.h"
 #include "host/window/widgets/WorkPage.h"
-#include "tests/support/Folder.h"
-#include "tests/window/ScriptedRunner.h"
+#include "tests/window/WindowBench.h"
 
-#include <gtest/gtest.h>
-
-#include <QAccessible>
-#include <QAction>
-#include <QApplication>
-#include <QCheckBox>
 #include <QComboBox>
-#include <QDropEvent>
 #include <QFileDialog>
-#include <QLabel>
 #include <QLineEdit>
-#include <QMenuBar>
-#include <QMimeData>
-#include <QPushButton>
 #include <QSignalSpy>
 #include <QSlider>
 #include <QSpinBox>
 #include <QToolButton>
 
-#include <set>
-
 using namespace movieconv::window;
 
-namespace {
-
-struct WindowTest : testing::Test {
-    Folder folder;
-    ScriptedRunner runner;
-    Settings settings{QString::fromStdString(folder / "settings")};
-    std::unique_ptr<App> app;
-
-    WindowTest() { Begin(); }
-
-    void Begin(const std::vector<std::string>& movies = {}) {
-        app.reset();
-        app = std::make_unique<App>(runner, settings, folder / "queue");
-        app->Begin(movies);
-    }
-
-    MainWindow& Window() { return app->Window(); }
-    const Entry& At(size_t row) { return app->TheQueue().Entries().at(row); }
-    ScriptedRunner::Script& Script(size_t number) { return *runner.scripts.at(number); }
-
-    std::string Movie(const std::string& name) {
-        WriteFile(folder / name, "movie60");
-        return folder / name;
-    }
-
-    void Add(const std::vector<std::string>& names) {
-        std::vector<std::string> paths;
-        for (const std::string& name : names)
-            paths.push_back(Movie(name));
-        const size_t before = app->TheQueue().Entries().size();
-        app->TheQueue().Add(paths);
-        ASSERT_TRUE(Await([&] {
-            const auto& entries = app->TheQueue().Entries();
-            return entries.size() == before + names.size() &&
-                   std::none_of(entries.begin(), entries.end(),
-                                [](auto& entry) { return entry.IsBeingExamined(); });
-        }));
-    }
-
-    template <class T>
-    T* The(const char* name = nullptr) {
-        T* found = Window().findChild<T*>(name == nullptr ? QString() : QLatin1String(name));
-        if (found == nullptr)
-            ADD_FAILURE() << "the window has no "
-                          << (name == nullptr ? T::staticMetaObject.className() : name);
-        return found;
-    }
-    template <class T>
-    T* Named(const QString& accessibleName) {
-        for (T* found : Window().findChildren<T*>())
-            if (found->accessibleName() == accessibleName)
-                return found;
-        ADD_FAILURE() << "the window has no " << accessibleName.toStdString();
-        return nullptr;
-    }
-    QPushButton* Button(const QString& text) {
-        for (QPushButton* button : Window().findChildren<QPushButton*>())
-            if (QString(button->text()).remove(QLatin1Char('&')) == text && button->isVisible())
-                return button;
-        ADD_FAILURE() << "the window shows no button " << text.toStdString();
-        return nullptr;
-    }
-    void Act(const char* name) {
-        QAction* action = The<QAction>(name);
-        EXPECT_TRUE(action->isEnabled()) << name;
-        action->trigger();
-    }
-    /// What has just come into a layout may not have a place yet on which it could be pressed.
-    static void Press(QWidget* button) {
-        ASSERT_NE(button, nullptr);
-        ASSERT_TRUE(Await([&] { return button->isVisible() && !button->size().isEmpty(); }));
-        QTest::mouseClick(button, Qt::LeftButton);
-    }
-    void Click(const QString& text) {
-        if (QPushButton* button = Button(text))
-            Press(button);
-    }
-    void Select(size_t row) { The<QueueView>()->Select(At(row).id); }
-    bool AwaitScripts(size_t count) {
-        return Await([&] { return runner.scripts.size() == count; });
-    }
-    bool Tells(const QString& words) {
-        for (const QLabel* label : The<NoticeBar>()->findChildren<QLabel*>())
-            if (label->text().contains(words))
-                return true;
-        return false;
-    }
-    template <class Page>
-    bool Shows() {
-        return The<Page>()->isVisible();
-    }
-
-    void Drop(const QByteArray& uris) {
-        QMimeData data;
-        data.setData(QStringLiteral("text/uri-list"), uris);
-        QDragEnterEvent enter({300, 300}, Qt::CopyAction, &data, Qt::LeftButton, Qt::NoModifier);
-        QApplication::sendEvent(&Window(), &enter);
-        ASSERT_TRUE(enter.isAccepted());
-        QDropEvent drop({300, 300}, Qt::CopyAction, &data, Qt::LeftButton, Qt::NoModifier);
-        QApplication::sendEvent(&Window(), &drop);
-    }
-};
-
-} // namespace
+using WindowTest = WindowBench;
 
 TEST_F(WindowTest, ExplainsItselfWhenItIsEmptyAndOpensFiles) {
     EXPECT_TRUE(The<QPushButton>("openButton")->isVisible());
@@ -256,6 +136,57 @@ TEST_F(WindowTest, AddsFilesOfSubtitles) {
     EXPECT_EQ(At(0).wishes.subtitleFiles, (Files{{folder / "a.srt", "fr"}}));
     Add({"b.mkv"});
     EXPECT_TRUE(At(1).wishes.subtitleFiles.empty());
+}
+
+TEST_F(WindowTest, LeavesTheSoundAsItIs) {
+    Add({"a.mkv"});
+    QCheckBox* keep = Check("Leave the sound as it is");
+    auto* channels = Named<QComboBox>("Sound channels");
+    const Wishes& wishes = At(0).wishes;
+    QTest::keyClick(keep, Qt::Key_Space);
+    EXPECT_EQ(wishes.copySound, true);
+    EXPECT_FALSE(channels->isEnabled());
+    EXPECT_FALSE(channels->toolTip().isEmpty()) << "why not";
+    QTest::keyClick(keep, Qt::Key_Space);
+    EXPECT_FALSE(wishes.copySound) << "as the preset has it";
+    EXPECT_TRUE(channels->isEnabled());
+    QTest::keyClick(Named<QComboBox>("Preset"), Qt::Key_Up);
+    EXPECT_EQ(wishes.preset, "kept");
+    EXPECT_TRUE(keep->isChecked());
+    QTest::keyClick(keep, Qt::Key_Space);
+    EXPECT_EQ(wishes.copySound, false);
+    Add({"b.mkv"});
+    EXPECT_EQ(At(1).wishes.copySound, false) << "the last choice is the next one's";
+}
+
+TEST_F(WindowTest, DrawsSubtitlesIntoThePictures) {
+    runner.subtitles = 3;
+    Add({"a.mkv"});
+    auto* box = Named<QComboBox>("Subtitles drawn into the pictures");
+    const Wishes& wishes = At(0).wishes;
+    QTest::keyClick(box, Qt::Key_Down);
+    EXPECT_EQ(wishes.burning.track, 3);
+    EXPECT_FALSE(wishes.subtitles) << "all others are carried";
+    QCheckBox* track = Check("French");
+    EXPECT_FALSE(track->isChecked());
+    QTest::keyClick(track, Qt::Key_Space);
+    EXPECT_EQ(wishes.subtitles, (QList<int>{3, 4, 5})) << "carried as well, since it is asked for";
+    QTest::keyClick(box, Qt::Key_Down);
+    EXPECT_EQ(wishes.burning.track, 4);
+    EXPECT_EQ(wishes.subtitles, (QList<int>{3, 5}));
+    Press(Named<QPushButton>("Draw the subtitles of a file"));
+    auto* dialog = The<QFileDialog>("openSubtitles");
+    EXPECT_FALSE(dialog->isModal());
+    Q_EMIT dialog->fileSelected(QString::fromStdString(folder / "a.srt"));
+    delete dialog;
+    EXPECT_FALSE(wishes.burning.track);
+    EXPECT_EQ(wishes.burning.file, folder / "a.srt");
+    EXPECT_EQ(box->currentText(), "a.srt");
+    Add({"b.mkv"});
+    EXPECT_FALSE(At(1).wishes.burning.IsWanted()) << "it belongs to one movie";
+    Select(0);
+    QTest::keyClick(box, Qt::Key_Home);
+    EXPECT_FALSE(wishes.burning.IsWanted());
 }
 
 TEST_F(WindowTest, ChoosesWhatIsSeldomNeeded) {
@@ -535,104 +466,4 @@ TEST_F(WindowTest, StaysWhollyUsableWithFiveHundredEntries) {
     Act("start");
     ASSERT_TRUE(AwaitScripts(1));
     EXPECT_EQ(app->TheDispatcher().Now().waiting, 499);
-}
-
-namespace {
-
-/// Visits all that a screen reader can reach, below `node`.
-void Visit(QAccessibleInterface* node, std::set<QAccessibleInterface*>& seen, QStringList& nameless) {
-    if (node == nullptr || !node->isValid() || !seen.insert(node).second)
-        return;
-    const std::set<QAccessible::Role> needNames = {
-        QAccessible::PushButton,   QAccessible::CheckBox, QAccessible::RadioButton, QAccessible::ComboBox,
-        QAccessible::EditableText, QAccessible::Slider,   QAccessible::ProgressBar, QAccessible::List,
-        QAccessible::ListItem,     QAccessible::MenuItem, QAccessible::Graphic};
-    const bool partOfAnother = node->parent() != nullptr && node->parent()->role() == QAccessible::ComboBox;
-    if (needNames.contains(node->role()) && !partOfAnother && node->text(QAccessible::Name).isEmpty() &&
-        !node->state().invisible) {
-        const QObject* object = node->object();
-        nameless += QStringLiteral("%1 %2").arg(object ? object->metaObject()->className() : "?",
-                                                object ? object->objectName() : QString());
-    }
-    for (int i = 0; i < node->childCount(); ++i)
-        Visit(node->child(i), seen, nameless);
-}
-
-} // namespace
-
-TEST_F(WindowTest, NamesEveryControlForScreenReaders) {
-    Add({"a.mkv", "b.mkv", "c.mkv"});
-    const auto visit = [&] {
-        std::set<QAccessibleInterface*> seen;
-        QStringList nameless;
-        Visit(QAccessible::queryAccessibleInterface(&Window()), seen, nameless);
-        EXPECT_TRUE(nameless.isEmpty()) << nameless.join("\n").toStdString();
-        return seen.size();
-    };
-    EXPECT_GT(visit(), 50U);
-    for (QToolButton* button : The<EntryPage>()->findChildren<QToolButton*>())
-        if (button->isCheckable())
-            button->click();
-    visit();
-    Act("start");
-    ASSERT_TRUE(AwaitScripts(1));
-    visit();
-    Script(0).End(Ending::kFailed, "It broke.");
-    ASSERT_TRUE(AwaitScripts(2));
-    Act("quit");
-    Select(0);
-    visit();
-    Act("naming");
-    std::set<QAccessibleInterface*> seen;
-    QStringList nameless;
-    Visit(QAccessible::queryAccessibleInterface(The<NamingDialog>()), seen, nameless);
-    EXPECT_TRUE(nameless.isEmpty()) << nameless.join("\n").toStdString();
-}
-
-TEST_F(WindowTest, GivesEveryKeyToOneControl) {
-    Add({"a.mkv"});
-    std::map<QString, QStringList> keys;
-    const auto add = [&](const QString& words) {
-        const QString key = QKeySequence::mnemonic(words).toString();
-        if (!key.isEmpty())
-            keys[key] += words;
-    };
-    for (const QAction* action : Window().menuBar()->actions())
-        add(action->text());
-    for (QToolButton* button : The<EntryPage>()->findChildren<QToolButton*>())
-        if (button->isCheckable())
-            button->click();
-    for (QWidget* widget : Window().findChildren<QWidget*>()) {
-        const auto* button = qobject_cast<QAbstractButton*>(widget);
-        const auto* label = qobject_cast<QLabel*>(widget);
-        if (widget->isVisible() && button != nullptr)
-            add(button->text());
-        else if (widget->isVisible() && label != nullptr && label->buddy() != nullptr)
-            add(label->text());
-    }
-    EXPECT_GT(keys.size(), 12U);
-    for (const auto& [key, owners] : keys)
-        EXPECT_EQ(owners.size(), 1) << key.toStdString() << ": " << owners.join(", ").toStdString();
-}
-
-TEST_F(WindowTest, ReachesEveryControlByTab) {
-    Add({"a.mkv"});
-    Window().activateWindow();
-    ASSERT_TRUE(QTest::qWaitForWindowActive(&Window()));
-    std::set<QWidget*> reached;
-    The<QueueView>()->setFocus();
-    for (int i = 0; i < 60; ++i) {
-        QTest::keyClick(QApplication::focusWidget(), Qt::Key_Tab);
-        reached.insert(QApplication::focusWidget());
-    }
-    for (QWidget* widget : Window().findChildren<QWidget*>()) {
-        const bool control = qobject_cast<QAbstractButton*>(widget) || qobject_cast<QComboBox*>(widget) ||
-                             qobject_cast<QLineEdit*>(widget) || qobject_cast<QSlider*>(widget);
-        const bool inner = widget->parentWidget() && qobject_cast<QLineEdit*>(widget->parentWidget());
-        if (control && !inner && widget->isVisibleTo(&Window()) && widget->isEnabled() &&
-            widget->focusPolicy() != Qt::NoFocus) {
-            EXPECT_TRUE(reached.contains(widget))
-                << widget->metaObject()->className() << " " << widget->accessibleName().toStdString();
-        }
-    }
 }

@@ -67,10 +67,14 @@ Notifier::Notifier(QObject* parent) : QObject(parent) {
                                           SLOT(OnAction(uint, QString)));
 }
 
-void Notifier::Notify(const QString& title, const QString& text) {
+void Notifier::Notify(const QString& title, const QString& text, bool audibly) {
     QDBusMessage message = QDBusMessage::createMethodCall(kNotifications, kNotificationsPath, kNotifications,
                                                           QStringLiteral("Notify"));
-    const QVariantMap hints{{QStringLiteral("desktop-entry"), QStringLiteral("org.movieconv.MovieConv")}};
+    QVariantMap hints{{QStringLiteral("desktop-entry"), QStringLiteral("org.movieconv.MovieConv")}};
+    if (audibly)
+        hints.insert(QStringLiteral("sound-name"), QStringLiteral("complete"));
+    else
+        hints.insert(QStringLiteral("suppress-sound"), true);
     message << QStringLiteral("MovieConv") << last_ << QStringLiteral("org.movieconv.MovieConv") << title
             << text << QStringList{QStringLiteral("default"), tr("Show")} << hints << -1;
     Call(QDBusConnection::sessionBus(), message, this, [this](const QDBusPendingCall& call) {

@@ -35,7 +35,8 @@ class Notifier : public QObject {
 public:
     explicit Notifier(QObject* parent = nullptr);
 
-    void Notify(const QString& title, const QString& text);
+    /// `audibly`: with the desktop's sound for it, if it has one.
+    void Notify(const QString& title, const QString& text, bool audibly);
 
 Q_SIGNALS:
     /// The user chose it.

@@ -2,11 +2,11 @@
 
 #include "host/window/model/Intake.h"
 #include "host/window/model/Words.h"
-#include "text/Path.h"
+
+#include <QSet>
 
 #include <algorithm>
 #include <filesystem>
-#include <set>
 #include <stdexcept>
 #include <utility>
 
@@ -33,7 +33,8 @@ QString Queue::Restore() {
     for (Entry& entry : entries_)
         entry.id = ++lastId_;
     endResetModel();
-    Q_EMIT Rearranged();
+    const Batch batch(*this);
+    TellRearranged();
     for (const Entry& entry : entries_)
         if (entry.state == State::kWaiting || entry.state == State::kInterrupted)
             Examine(entry.id);
@@ -67,9 +68,10 @@ void Queue::Add(std::vector<std::string> paths) {
 
 void Queue::Append(const std::vector<std::string>& movies) {
     if (movies.empty()) {
-        Q_EMIT Rearranged();
+        TellRearranged();
         return;
     }
+    const Batch batch(*this);
     const int first = static_cast<int>(entries_.size());
     beginInsertRows({}, first, first + static_cast<int>(movies.size()) - 1);
     for (const std::string& movie : movies) {
@@ -82,25 +84,35 @@ void Queue::Append(const std::vector<std::string>& movies) {
     }
     endInsertRows();
     Keep();
-    Q_EMIT Rearranged();
+    TellRearranged();
     for (size_t row = static_cast<size_t>(first); row < entries_.size(); ++row)
         Examine(entries_[row].id);
 }
 
 void Queue::Remove(const QList<quint64>& ids) {
-    const size_t before = entries_.size();
-    for (const quint64 id : ids) {
-        const int row = RowOf(id);
-        if (row < 0 || entries_[static_cast<size_t>(row)].state == State::kActive)
-            continue;
-        beginRemoveRows({}, row, row);
-        entries_.erase(entries_.begin() + row);
-        endRemoveRows();
+    const QSet<quint64> meant(ids.begin(), ids.end());
+    const auto goes = [&](int row) {
+        const Entry& entry = entries_[static_cast<size_t>(row)];
+        return entry.state != State::kActive && meant.contains(entry.id);
+    };
+    const Batch batch(*this);
+    int last = rowCount() - 1;
+    while (last >= 0) {
+        int first = last;
+        while (first >= 0 && goes(first))
+            --first;
+        if (first < last)
+            RemoveRows(first + 1, last);
+        last = first - 1; // which stays
     }
-    if (entries_.size() != before) {
-        Keep();
-        Q_EMIT Rearranged();
-    }
+}
+
+void Queue::RemoveRows(int first, int last) {
+    beginRemoveRows({}, first, last);
+    entries_.erase(entries_.begin() + first, entries_.begin() + last + 1);
+    endRemoveRows();
+    Keep();
+    TellRearranged();
 }
 
 void Queue::RemoveOver() {
@@ -118,6 +130,30 @@ void Queue::Move(quint64 id, int row) {
         moveRows({}, from, 1, {}, to > from ? to + 1 : to);
 }
 
+void Queue::MoveBy(const QList<quint64>& ids, int by) {
+    QList<int> rows;
+    for (const quint64 id : ids)
+        rows.append(RowOf(id));
+    std::sort(rows.begin(), rows.end());
+    const int edge = by > 0 ? rowCount() - 1 : 0;
+    if (rows.isEmpty() || rows.front() < 0 || (by > 0 ? rows.back() : rows.front()) == edge)
+        return;
+    if (by > 0)
+        std::reverse(rows.begin(), rows.end());
+    const Batch batch(*this);
+    for (const int row : rows)
+        Move(entries_[static_cast<size_t>(row)].id, row + by);
+}
+
+void Queue::MoveBefore(const QList<quint64>& ids, int row) {
+    const Batch batch(*this);
+    int before = row;
+    for (const quint64 id : ids) {
+        moveRows({}, RowOf(id), 1, {}, before);
+        before = RowOf(id) + 1;
+    }
+}
+
 bool Queue::moveRows(const QModelIndex& from, int first, int count, const QModelIndex& to, int before) {
     const int end = first + count;
     if (count < 1 || first < 0 || end > rowCount() || before < 0 || before > rowCount() ||
@@ -130,7 +166,7 @@ bool Queue::moveRows(const QModelIndex& from, int first, int count, const QModel
         std::rotate(begin + first, begin + end, begin + before);
     endMoveRows();
     Keep();
-    Q_EMIT Rearranged();
+    TellRearranged();
     return true;
 }
 
@@ -164,7 +200,14 @@ void Queue::SetReplace(quint64 id, bool replace) {
     AfterEdit(id);
 }
 
+void Queue::SetWishesOfAll(const Wishes& wishes) {
+    const Batch batch(*this);
+    for (const Entry& entry : entries_)
+        SetWishes(entry.id, WithOwn(wishes, entry.wishes));
+}
+
 void Queue::Retry(const QList<quint64>& ids) {
+    const Batch batch(*this);
     for (const quint64 id : ids) {
         const Entry* entry = Find(id);
         if (entry == nullptr || !entry->IsOver())
@@ -187,6 +230,7 @@ void Queue::SetNaming(const Naming& naming) {
     if (naming == naming_)
         return;
     naming_ = naming;
+    const Batch batch(*this);
     for (Entry& entry : entries_) {
         if (entry.state != State::kWaiting || entry.targetNamed)
             continue;
@@ -213,9 +257,19 @@ void Queue::FillPresets() {
 QString Queue::ExtensionFor(const Wishes& wishes) const {
     if (wishes.format)
         return *wishes.format;
-    const auto preset = std::find_if(presets_.begin(), presets_.end(),
-                                     [&](const PresetFacts& facts) { return facts.name == wishes.preset; });
-    return preset == presets_.end() ? QStringLiteral("mp4") : preset->extension;
+    const PresetFacts* preset = FindPreset(wishes.preset);
+    return preset == nullptr ? QStringLiteral("mp4") : preset->extension;
+}
+
+QString Queue::LineOf(const Entry& entry) const {
+    const PresetFacts* preset = FindPreset(entry.wishes.preset);
+    return StateLine(entry, preset == nullptr ? entry.wishes.preset : preset->title);
+}
+
+const PresetFacts* Queue::FindPreset(const QString& name) const {
+    const auto found = std::find_if(presets_.begin(), presets_.end(),
+                                    [&](const PresetFacts& facts) { return facts.name == name; });
+    return found == presets_.end() ? nullptr : &*found;
 }
 
 int Queue::rowCount(const QModelIndex& parent) const {
@@ -232,7 +286,7 @@ QVariant Queue::data(const QModelIndex& index, int role) const {
     case Qt::ToolTipRole:
         return Readable(entry.source);
     case Qt::AccessibleTextRole:
-        return QStringLiteral("%1, %2").arg(NameOf(entry.source), StateLine(entry));
+        return QStringLiteral("%1, %2").arg(NameOf(entry.source), LineOf(entry));
     case kIdRole:
         return entry.id;
     default:
@@ -248,22 +302,23 @@ Qt::ItemFlags Queue::flags(const QModelIndex& index) const {
 
 /// Finds out what the movie is, whether its target's name is free, and what stands in the way.
 void Queue::Examine(quint64 id) {
+    examineAfter_.append(id);
+    const Batch batch(*this); // perhaps within another one
+}
+
+void Queue::ExamineAmong(const std::shared_ptr<const Targets>& targets, quint64 id) {
     const Entry* entry = Find(id);
     if (entry == nullptr)
         return;
-    std::set<std::string> others;
-    for (const Entry& other : entries_)
-        if (other.id != id)
-            others.insert(other.target);
-    worker_.Do(id, [this, id, seen = *entry, naming = naming_, others = std::move(others),
-                    extension = ExtensionFor(entry->wishes)] {
+    worker_.Do(id, [this, targets, seen = *entry, naming = naming_, extension = ExtensionFor(entry->wishes)] {
         Entry found = seen;
         try {
             if (!found.facts)
                 found.facts = runner_.Look(found.source);
             if (!found.targetNamed && found.state == State::kWaiting) {
                 found.target = TargetFor(found, naming, extension, [&](const std::string& path) {
-                    return others.contains(path) || Exists(path);
+                    const size_t own = path == seen.target ? 1 : 0;
+                    return targets->count(path) > own || Exists(path);
                 });
             }
             found.findings =
@@ -272,27 +327,29 @@ void Queue::Examine(quint64 id) {
         } catch (const std::runtime_error& error) {
             found.unusable = QString::fromUtf8(error.what());
         }
-        inbox_.Put([this, id, seen, found] {
-            const Entry* now = Find(id);
-            if (now == nullptr || now->state != seen.state || now->wishes != seen.wishes ||
-                now->target != seen.target || now->replace != seen.replace)
-                return; // edited meanwhile, and so examined again
-            if (!found.targetNamed && IsTakenByOther(*now, found.target)) {
-                Examine(id);
-                return;
-            }
-            Change(
-                id,
-                [&](Entry& known) {
-                    known.facts = found.facts;
-                    known.target = found.target;
-                    known.findings = found.findings;
-                    known.unusable = found.unusable;
-                    known.examined = true;
-                },
-                found.target != seen.target);
-        });
+        inbox_.Put([this, seen, found] { TakeFound(seen, found); });
     });
+}
+
+void Queue::TakeFound(const Entry& seen, const Entry& found) {
+    const Entry* now = Find(seen.id);
+    if (now == nullptr || now->state != seen.state || now->wishes != seen.wishes ||
+        now->target != seen.target || now->replace != seen.replace)
+        return; // edited meanwhile, and so examined again
+    if (!found.targetNamed && IsTakenByOther(*now, found.target)) {
+        Examine(seen.id);
+        return;
+    }
+    Change(
+        seen.id,
+        [&](Entry& known) {
+            known.facts = found.facts;
+            known.target = found.target;
+            known.findings = found.findings;
+            known.unusable = found.unusable;
+            known.examined = true;
+        },
+        found.target != seen.target);
 }
 
 /// By the rules, and apart from the other entries' targets; whether there is such a file is found out later.
@@ -308,7 +365,29 @@ bool Queue::IsTakenByOther(const Entry& entry, const std::string& path) const {
 }
 
 void Queue::Keep() {
-    journal_.Keep(entries_);
+    keepAfter_ = true;
+    const Batch batch(*this);
+}
+
+void Queue::TellRearranged() {
+    tellAfter_ = true;
+    const Batch batch(*this);
+}
+
+Queue::Batch::~Batch() {
+    if (--queue_.batches_ > 0)
+        return;
+    if (std::exchange(queue_.keepAfter_, false))
+        queue_.journal_.Keep(queue_.entries_);
+    if (const QList<quint64> ids = std::exchange(queue_.examineAfter_, {}); !ids.isEmpty()) {
+        auto targets = std::make_shared<Targets>();
+        for (const Entry& entry : queue_.entries_)
+            targets->insert(entry.target);
+        for (const quint64 id : ids)
+            queue_.ExamineAmong(targets, id);
+    }
+    if (std::exchange(queue_.tellAfter_, false))
+        Q_EMIT queue_.Rearranged();
 }
 
 Entry* Queue::FindWaiting(quint64 id) {

@@ -10,6 +10,8 @@
 #include <QAbstractListModel>
 
 #include <functional>
+#include <memory>
+#include <set>
 #include <vector>
 
 namespace movieconv::window {
@@ -43,12 +45,18 @@ public:
     void RemoveOver();
     /// So that it stands in `row`.
     void Move(quint64 id, int row);
+    /// By one place, up with -1 and down with 1; together, and not at all when one of them is at the end.
+    void MoveBy(const QList<quint64>& ids, int by);
+    /// In front of what stands in `row`, in their order.
+    void MoveBefore(const QList<quint64>& ids, int row);
 
     /// Change an entry that is waiting; others are left alone.
     void SetWishes(quint64 id, const Wishes& wishes);
     /// An empty path goes back to the naming rules.
     void SetTarget(quint64 id, const std::string& path);
     void SetReplace(quint64 id, bool replace);
+    /// Gives all that wait these wishes, but for what belongs to one movie alone.
+    void SetWishesOfAll(const Wishes& wishes);
     /// Makes what is over wait again.
     void Retry(const QList<quint64>& ids);
 
@@ -66,6 +74,8 @@ public:
     void FillPresets();
     /// The extension of the file that the wishes make.
     QString ExtensionFor(const Wishes& wishes) const;
+    /// What the list says about an entry below its name.
+    QString LineOf(const Entry& entry) const;
 
     int rowCount(const QModelIndex& parent = {}) const override;
     QVariant data(const QModelIndex& index, int role) const override;
@@ -81,10 +91,30 @@ Q_SIGNALS:
     void Complaint(const QString& sentence);
 
 private:
+    using Targets = std::multiset<std::string>;
+
+    /// Makes many changes one: when it ends, the journal is written once, Rearranged is told once, and all
+    /// that have to be are examined.
+    class Batch {
+    public:
+        explicit Batch(Queue& queue) : queue_(queue) { ++queue_.batches_; }
+        Batch(const Batch&) = delete;
+        Batch& operator=(const Batch&) = delete;
+        ~Batch();
+
+    private:
+        Queue& queue_;
+    };
+
     void Append(const std::vector<std::string>& movies);
+    void RemoveRows(int first, int last);
     void Examine(quint64 id);
+    void ExamineAmong(const std::shared_ptr<const Targets>& targets, quint64 id);
+    void TakeFound(const Entry& seen, const Entry& found);
     void AssignTarget(Entry& entry);
     void Keep();
+    void TellRearranged();
+    const PresetFacts* FindPreset(const QString& name) const;
     Entry* FindWaiting(quint64 id);
     void AfterEdit(quint64 id);
     bool IsTakenByOther(const Entry& entry, const std::string& path) const;
@@ -97,6 +127,10 @@ private:
     Naming naming_;
     Wishes defaults_;
     int searches_ = 0;
+    int batches_ = 0;
+    bool keepAfter_ = false; // these three: when the batch ends
+    bool tellAfter_ = false;
+    QList<quint64> examineAfter_;
     Inbox inbox_;   // of the worker's results
     Worker worker_; // last: its tasks refer to the rest
 };

@@ -22,7 +22,8 @@ struct TrackFacts {
     int number = 0;   ///< As Wishes name it.
     QString language; ///< ISO code; empty when the source does not tell.
     QString title;
-    QString details; ///< "aac, 5.1, 48 kHz".
+    QString details;     ///< "AAC, 5.1".
+    int64_t bitRate = 0; ///< Bits a second; 0 when the source does not tell.
 };
 
 /// What a runner knows of a movie beyond the facts, for itself.
@@ -39,8 +40,8 @@ struct MovieFacts {
     bool lengthKnown = false;
     int width = 0; ///< As shown; 0 without pictures.
     int height = 0;
-    double rate = 0; ///< Pictures a second.
-    QString pictureCodec;
+    double rate = 0;      ///< Pictures a second.
+    QString pictureCodec; ///< "H.264".
     bool interlaced = false;
     bool hdr = false;
     int depth = 8; ///< Bits of a colour.
@@ -64,6 +65,7 @@ struct PresetFacts {
     QString description; ///< One line.
     QString extension;   ///< Of the files it makes.
     int quality = 60;    ///< On Wishes' scale, or -1 when there is nothing to choose.
+    bool copiesSound = false;
 };
 
 /// What the window need not offer where it is missing.

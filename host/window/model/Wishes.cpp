@@ -11,6 +11,7 @@ namespace {
 
 constexpr double kLongest = 1e7; // seconds, four months
 constexpr int kMostCut = 16384;  // pixels
+constexpr int kMostTracks = 99999;
 
 template <class T>
 void Put(QJsonObject& json, const char* key, const std::optional<T>& value) {
@@ -87,11 +88,18 @@ QString WordFor(Wishes::Deinterlace choice) {
                                                  : QStringLiteral("auto");
 }
 
-void PutTexts(QJsonObject& json, const Wishes& wishes) {
+void PutSubtitles(QJsonObject& json, const Wishes& wishes) {
+    Put(json, "subtitles", wishes.subtitles);
     if (!wishes.subtitleFiles.empty())
         json[QLatin1String("subtitle_files")] = FilesToJson(wishes.subtitleFiles);
     if (!wishes.subtitleCharset.isEmpty())
         json[QLatin1String("subtitle_charset")] = wishes.subtitleCharset;
+    Put(json, "burnt_track", wishes.burning.track);
+    if (!wishes.burning.file.empty())
+        json[QLatin1String("burnt_file")] = EncodePath(wishes.burning.file);
+}
+
+void PutTexts(QJsonObject& json, const Wishes& wishes) {
     if (!wishes.chapters)
         json[QLatin1String("chapters")] = false;
     if (!wishes.texts)
@@ -113,9 +121,28 @@ Wishes WithOwn(const Wishes& general, const Wishes& own) {
     both.subtitles = own.subtitles;
     both.subtitleFiles = own.subtitleFiles;
     both.subtitleCharset = own.subtitleCharset;
+    both.burning = own.burning;
     both.cut = own.cut;
     both.title = own.title;
     return both;
+}
+
+void SetBegin(Wishes& wishes, double begin, double length) {
+    if (begin < length)
+        wishes.begin = begin;
+    if (wishes.end && wishes.begin >= *wishes.end)
+        wishes.end.reset();
+}
+
+void SetEnd(Wishes& wishes, std::optional<double> end, double length) {
+    const bool makesSense = end && *end > wishes.begin && *end < length;
+    wishes.end = makesSense ? end : std::nullopt;
+}
+
+void Burn(Wishes& wishes, const Burning& burning) {
+    wishes.burning = burning;
+    if (burning.track && wishes.subtitles)
+        wishes.subtitles->removeAll(*burning.track);
 }
 
 QJsonObject ToJson(const Wishes& wishes) {
@@ -131,7 +158,8 @@ QJsonObject ToJson(const Wishes& wishes) {
     Put(json, "end", wishes.end);
     Put(json, "clip", wishes.clip);
     Put(json, "sounds", wishes.sounds);
-    Put(json, "subtitles", wishes.subtitles);
+    PutSubtitles(json, wishes);
+    Put(json, "copy_sound", wishes.copySound);
     Put(json, "channels", wishes.channels);
     if (wishes.deinterlace != defaults.deinterlace)
         json[QLatin1String("deinterlace")] = WordFor(wishes.deinterlace);
@@ -176,6 +204,11 @@ Wishes WishesFromJson(const QJsonObject& json) {
     wishes.depth = IntegerOf(json, "depth", 8, 10);
     wishes.subtitleFiles = SubtitleFilesOf(json[QLatin1String("subtitle_files")]);
     wishes.subtitleCharset = json[QLatin1String("subtitle_charset")].toString();
+    wishes.burning.track = IntegerOf(json, "burnt_track", 0, kMostTracks);
+    if (!wishes.burning.track)
+        wishes.burning.file = DecodePath(json[QLatin1String("burnt_file")]);
+    if (json[QLatin1String("copy_sound")].isBool())
+        wishes.copySound = json[QLatin1String("copy_sound")].toBool();
     wishes.chapters = json[QLatin1String("chapters")].toBool(true);
     wishes.texts = json[QLatin1String("texts")].toBool(true);
     if (json[QLatin1String("title")].isString())

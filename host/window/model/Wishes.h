@@ -20,6 +20,15 @@ struct SubtitleFile {
     bool operator==(const SubtitleFile&) const = default;
 };
 
+/// Subtitles that are drawn into the pictures: a track of the source's, or a file, or none.
+struct Burning {
+    std::optional<int> track; ///< Its number.
+    std::string file;
+
+    bool IsWanted() const { return track || !file.empty(); }
+    bool operator==(const Burning&) const = default;
+};
+
 /// Pixels to cut off.
 struct Margins {
     int top = 0;
@@ -44,10 +53,12 @@ struct Wishes {
     std::optional<double> end;           ///< Seconds.
     std::optional<double> clip;          ///< Seconds of each clip.
     std::optional<QList<int>> sounds;    ///< Numbers of sound tracks, as the source counts them.
-    std::optional<QList<int>> subtitles; ///< Numbers of subtitle tracks.
+    std::optional<QList<int>> subtitles; ///< Numbers of subtitle tracks; nothing: all that are not drawn.
     std::vector<SubtitleFile> subtitleFiles;
-    QString subtitleCharset;     ///< Of these files; empty: what they look like.
-    std::optional<int> channels; ///< 1 or 2.
+    QString subtitleCharset;       ///< Of these files; empty: what they look like.
+    Burning burning;               ///< Subtitles drawn into the pictures.
+    std::optional<bool> copySound; ///< Sound stays as it is coded.
+    std::optional<int> channels;   ///< 1 or 2.
     Deinterlace deinterlace = Deinterlace::kAuto;
     bool crop = false;          ///< Cut black borders off.
     std::optional<Margins> cut; ///< Cut that off instead.
@@ -67,6 +78,13 @@ Wishes ForAnyMovie(const Wishes& wishes);
 
 /// `general`, with what belongs to one movie alone from `own`.
 Wishes WithOwn(const Wishes& general, const Wishes& own);
+
+/// Other ends of the range, as far as they make sense in a movie of that length in seconds.
+void SetBegin(Wishes& wishes, double begin, double length);
+void SetEnd(Wishes& wishes, std::optional<double> end, double length);
+
+/// Has subtitles drawn into the pictures. A track that was chosen to be carried is not any more.
+void Burn(Wishes& wishes, const Burning& burning);
 
 /// Only what differs from the defaults.
 QJsonObject ToJson(const Wishes& wishes);

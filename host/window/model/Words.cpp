@@ -29,7 +29,7 @@ QString ActiveLine(const Figures& figures) {
     return parts.isEmpty() ? PhaseText(figures.phase) : parts.join(QStringLiteral(" · "));
 }
 
-QString WaitingLine(const Entry& entry) {
+QString WaitingLine(const Entry& entry, const QString& preset) {
     if (!entry.unusable.isEmpty())
         return Words::tr("Cannot be converted");
     QStringList parts;
@@ -37,6 +37,7 @@ QString WaitingLine(const Entry& entry) {
         parts += Words::tr("Looking at it…");
     else if (const auto seconds = entry.SecondsWanted())
         parts += ClockText(*seconds);
+    parts += preset;
     parts += Words::tr("to %1").arg(NameOf(entry.target));
     return parts.join(QStringLiteral(" · "));
 }
@@ -138,10 +139,10 @@ QString PhaseText(Phase phase) {
     return {};
 }
 
-QString StateLine(const Entry& entry) {
+QString StateLine(const Entry& entry, const QString& preset) {
     switch (entry.state) {
     case State::kWaiting:
-        return WaitingLine(entry);
+        return WaitingLine(entry, preset);
     case State::kActive:
         return ActiveLine(entry.figures);
     case State::kDone:

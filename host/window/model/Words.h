@@ -19,13 +19,13 @@ QString LeftText(double seconds);
 QString BytesText(int64_t bytes);
 /// "8.4×".
 QString SpeedText(double speed);
-/// "1920 × 1080, 25 pictures a second, h264, 42:10".
+/// "1920 × 1080 · 25 pictures a second · H.264 · 42:10".
 QString FactsLine(const MovieFacts& facts);
-/// A track for people: "English, Director's comments (aac, stereo)".
+/// A track for people: "English, Director's comments (AAC, stereo)".
 QString TrackLine(const TrackFacts& track);
 QString PhaseText(Phase phase);
-/// What the list says about an entry below its name.
-QString StateLine(const Entry& entry);
+/// What the list says about an entry below its name. `preset`: its title.
+QString StateLine(const Entry& entry, const QString& preset);
 
 } // namespace movieconv::window
 

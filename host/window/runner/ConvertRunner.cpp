@@ -1,25 +1,19 @@
 #include "host/window/runner/ConvertRunner.h"
 
-#include "host/convert/CarryOver.h"
-#include "host/convert/CodecPlan.h"
-#include "host/convert/EncodePlan.h"
 #include "host/convert/Formats.h"
 #include "host/convert/Job.h"
-#include "host/convert/Room.h"
 #include "host/convert/Sources.h"
 #include "host/convert/StillPicture.h"
-#include "host/window/model/Words.h"
+#include "host/window/runner/Foresight.h"
 #include "host/window/runner/LibraryWords.h"
 #include "host/window/runner/PresetShelf.h"
+#include "host/window/runner/SourceFacts.h"
 #include "host/window/runner/Translation.h"
-#include "text/Path.h"
 
 #include <QCoreApplication>
 
 #include <atomic>
 #include <chrono>
-#include <filesystem>
-#include <mutex>
 #include <stdexcept>
 #include <system_error>
 #include <utility>
@@ -32,13 +26,6 @@ constexpr std::chrono::milliseconds kBetweenPictures{250};
 struct Texts {
     Q_DECLARE_TR_FUNCTIONS(ConvertRunner)
 };
-
-QString Sentence(const std::string& text) {
-    QString sentence = QString::fromStdString(text);
-    if (!sentence.isEmpty())
-        sentence[0] = sentence[0].toUpper();
-    return sentence.endsWith(QLatin1Char('.')) || sentence.isEmpty() ? sentence : sentence + QLatin1Char('.');
-}
 
 /// A picture that shares the memory of the library's.
 QImage ToImage(const std::shared_ptr<const ShownPicture>& picture) {
@@ -57,7 +44,7 @@ QImage ToImage(const std::shared_ptr<const ShownPicture>& picture) {
 QString FailureSentence(const Failure& failure) {
     const QString what = failure.Why() == Reason::kNoMemory && failure.Text().empty()
                              ? Texts::tr("There was not enough memory.")
-                             : Sentence(failure.Text());
+                             : SentenceOf(failure.Text());
     QString advice;
     if (failure.Why() == Reason::kExists)
         advice = Texts::tr("Choose another name, or let it be replaced.");
@@ -100,7 +87,7 @@ public:
     }
     void LeftBehind(const NotCarried& what) override { leftBehind_ += LineOf(what); }
     void Closed(const ClosedFile& file) override { files_.push_back(file.path); }
-    void Warned(const movieconv::Warning& warning) override { listener_->OnNote(Sentence(warning.text)); }
+    void Warned(const movieconv::Warning& warning) override { listener_->OnNote(SentenceOf(warning.text)); }
     void Showed(const std::shared_ptr<const ShownPicture>& picture) override {
         listener_->OnPicture(ToImage(picture));
     }
@@ -172,89 +159,6 @@ private:
     Worker& remover_;
 };
 
-TrackFacts TrackOf(const StreamInfo& stream) {
-    TrackFacts track;
-    track.number = stream.index;
-    track.language = QString::fromStdString(stream.language);
-    track.title = QString::fromStdString(stream.title);
-    track.details = QString::fromStdString(stream.codec);
-    if (stream.sound && !stream.sound->layout.empty())
-        track.details += QStringLiteral(", ") + QString::fromStdString(stream.sound->layout);
-    return track;
-}
-
-struct SourceKnowledge : OwnKnowledge {
-    SourceInfo info;
-};
-
-/// The value of a text of the movie's; empty when there is none.
-QString TextOf(const SourceInfo& info, const char* key) {
-    for (const Tag& tag : info.tags)
-        if (tag.key == key)
-            return QString::fromStdString(tag.value);
-    return {};
-}
-
-void AddPictures(MovieFacts& facts, const PictureStreamInfo& pictures) {
-    facts.width = pictures.width;
-    facts.height = pictures.height;
-    facts.rate = pictures.frameRate;
-    facts.pictureCodec = QString::fromStdString(pictures.codec);
-    facts.interlaced = pictures.interlaced;
-    facts.hdr = IsHdr(pictures);
-    facts.depth = pictures.depth;
-}
-
-void WarnOfTarget(Findings& findings, const Order& order) {
-    namespace fs = std::filesystem;
-    std::error_code unknown;
-    findings.targetExists = fs::exists(fs::symlink_status(order.target, unknown));
-    if (findings.targetExists && fs::equivalent(order.source, order.target, unknown))
-        findings.warnings +=
-            Texts::tr("The new file cannot take the place of its source. Choose another name.");
-    else if (findings.targetExists && !order.replace)
-        findings.warnings += Texts::tr("There is a file of this name already.");
-    else if (findings.targetExists)
-        findings.warnings += Texts::tr("The file that exists will be replaced.");
-}
-
-/// What the library is going to refuse, and what it is going to leave behind.
-void WarnOfContent(Findings& findings, const Order& order, const Request& request) {
-    std::error_code unknown;
-    for (const SubtitleFileWish& file : request.subtitleFiles)
-        if (!std::filesystem::is_regular_file(file.path, unknown))
-            findings.warnings += Texts::tr("The subtitles “%1” were not found.").arg(Readable(file.path));
-    const auto* known = dynamic_cast<const SourceKnowledge*>(order.facts.own.get());
-    if (known == nullptr)
-        return;
-    try {
-        const FileFormatInfo& format = ChooseFormat(request);
-        if (known->info.pictures && !request.noVideo)
-            PlanPictures(request, format, *known->info.pictures);
-        QStringList left;
-        for (const NotCarried& what : ForetellLeftBehind(known->info, request, format))
-            left += LineOf(what);
-        if (!left.isEmpty())
-            findings.notes +=
-                Texts::tr("Not carried over:") + QStringLiteral("\n• ") + left.join(QStringLiteral("\n• "));
-    } catch (const Failure& failure) {
-        findings.warnings += Sentence(failure.Text());
-    }
-}
-
-void WarnOfRoom(Findings& findings, const Order& order, const Request& request, const std::string& folder) {
-    const double seconds = request.length.value_or(order.facts.seconds - request.begin);
-    findings.needed = static_cast<int64_t>(seconds * EstimatedRate(order, request) / 8);
-    const int64_t free = FreeBytes(folder);
-    if (free < 0)
-        return;
-    findings.free = free;
-    if (free < *findings.needed) {
-        findings.warnings += Texts::tr("About %1 are needed, but only %2 are free in “%3”.")
-                                 .arg(BytesText(*findings.needed), BytesText(free), Readable(folder));
-    }
-}
-
 } // namespace
 
 Abilities ConvertRunner::Can() {
@@ -273,7 +177,7 @@ std::vector<PresetFacts> ConvertRunner::Presets() {
 std::vector<FormatFacts> ConvertRunner::Formats() {
     std::vector<FormatFacts> formats;
     for (const char* extension :
-         {"mp4", "mkv", "mov", "webm", "avi", "ts", "flv", "m4a", "mp3", "flac", "ogg", "wav"})
+         {"mp4", "mkv", "mov", "webm", "avi", "ts", "flv", "gif", "m4a", "mp3", "flac", "ogg", "wav"})
         if (const FileFormatInfo* format = FindFormat(extension))
             formats.push_back(
                 {QLatin1String(extension), QString::fromUtf8(format->szName), format->bHasVideo != 0});
@@ -284,7 +188,7 @@ PresetFacts ConvertRunner::LoadPreset(const std::string& path) {
     try {
         return TakeIntoShelf(path);
     } catch (const PresetError& error) {
-        throw std::runtime_error(Sentence(error.what()).toStdString());
+        throw std::runtime_error(SentenceOf(error.what()).toStdString());
     }
 }
 
@@ -313,47 +217,14 @@ MovieFacts ConvertRunner::Look(const std::string& path) {
     try {
         Request request;
         request.input = path;
-        const auto known = std::make_shared<SourceKnowledge>();
-        known->info = LookAtSource(request);
-        const SourceInfo& info = known->info;
-        MovieFacts facts;
-        facts.own = known;
-        facts.seconds = info.duration;
-        facts.lengthKnown = info.certainty != Certainty::kGuessed;
-        facts.bytes = info.bytes;
-        facts.title = TextOf(info, "title");
-        if (info.pictures)
-            AddPictures(facts, *info.pictures);
-        for (const StreamInfo& stream : info.streams) {
-            if (stream.kind == StreamKind::kSound)
-                facts.sounds.push_back(TrackOf(stream));
-            else if (stream.kind == StreamKind::kSubtitles)
-                facts.subtitles.push_back(TrackOf(stream));
-        }
-        facts.chapters = static_cast<int>(info.chapters.size());
-        return facts;
+        return FactsOf(LookAtSource(request));
     } catch (const Failure& failure) {
-        throw std::runtime_error(Sentence(failure.Text()).toStdString());
+        throw std::runtime_error(SentenceOf(failure.Text()).toStdString());
     }
 }
 
 Findings ConvertRunner::Check(const Order& order) {
-    Findings findings;
-    std::error_code unknown;
-    const std::string folder = text::FolderOf(order.target);
-    WarnOfTarget(findings, order);
-    if (!std::filesystem::is_directory(folder, unknown)) {
-        findings.warnings += Texts::tr("There is no folder “%1”.").arg(Readable(folder));
-        return findings;
-    }
-    try {
-        const Request request = ToRequest(order);
-        WarnOfContent(findings, order, request);
-        WarnOfRoom(findings, order, request, folder);
-    } catch (const PresetError& error) {
-        findings.warnings += Sentence(error.what());
-    }
-    return findings;
+    return Foresee(order);
 }
 
 QImage ConvertRunner::PictureAt(const std::string& path, double seconds, int width) {

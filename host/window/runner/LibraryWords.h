@@ -8,8 +8,13 @@
 
 namespace movieconv::window {
 
-/// "subtitles 3 (hdmv_pgs_subtitle, German): MP4 cannot hold them". What the library tells in words that are
-/// not known here stays as it is.
+/// A clause or a sentence of the library's; what is not known here stays as it is.
+QString InWindowsLanguage(const std::string& text);
+
+/// Likewise, with a capital letter and a full stop.
+QString SentenceOf(const std::string& text);
+
+/// "subtitles 3 (Blu-ray (PGS), German): MP4 cannot hold them".
 QString LineOf(const NotCarried& what);
 
 } // namespace movieconv::window

@@ -110,6 +110,7 @@ PresetFacts FactsOf(const Preset& preset) {
     if (const FileFormatInfo* format = FormatOf(preset))
         facts.extension = QString::fromUtf8(format->szExtensions).section(QLatin1Char(','), 0, 0);
     facts.quality = UsualQuality(preset);
+    facts.copiesSound = preset.preferences.copySound;
     return facts;
 }
 
@@ -157,8 +158,12 @@ void PutPictures(QJsonObject& video, const Preset& preset, const Wishes& wishes)
     video[QStringLiteral("quality")] = qualities;
 }
 
-void PutSound(QJsonObject& audio, const Wishes& wishes) {
-    if (wishes.channels)
+void PutSound(QJsonObject& audio, const Preset& preset, const Wishes& wishes) {
+    const bool copies = preset.preferences.copySound;
+    const bool copy = wishes.copySound.value_or(copies);
+    if (copy != copies)
+        audio[QStringLiteral("codec")] = copy ? QJsonValue(QStringLiteral("copy")) : QJsonValue::Null;
+    if (wishes.channels && !copy)
         audio[QStringLiteral("channels")] = *wishes.channels;
     if (!wishes.withSound)
         audio[QStringLiteral("leave_out")] = true;
@@ -235,7 +240,7 @@ void WritePreset(const std::string& path, const Wishes& wishes) {
     QJsonObject video = json[QStringLiteral("video")].toObject();
     QJsonObject audio = json[QStringLiteral("audio")].toObject();
     PutPictures(video, preset, wishes);
-    PutSound(audio, wishes);
+    PutSound(audio, preset, wishes);
     if (!video.isEmpty())
         json[QStringLiteral("video")] = video;
     if (!audio.isEmpty())

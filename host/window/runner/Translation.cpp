@@ -48,10 +48,24 @@ void AskForTracksAndTexts(Request& request, const Wishes& wishes) {
     for (const SubtitleFile& file : wishes.subtitleFiles)
         request.subtitleFiles.push_back({file.path, file.language.toStdString()});
     request.subtitleCharset = wishes.subtitleCharset.toStdString();
+    request.burnSubtitles =
+        wishes.burning.track ? std::to_string(*wishes.burning.track) : wishes.burning.file;
     request.noChapters = !wishes.chapters;
     request.noMetadata = !wishes.texts;
     if (wishes.title)
         request.metadata.push_back({"title", wishes.title->toStdString()});
+}
+
+/// Bits a second that the sound takes, about.
+double SoundRate(const Order& order, const Request& request) {
+    constexpr double kUsual = 128'000;
+    if (!request.copySound)
+        return request.preferences.audioRate.At(request.channels.value_or(2)).value_or(kUsual);
+    double bits = 0;
+    for (const TrackFacts& track : order.facts.sounds)
+        if (!order.wishes.sounds || order.wishes.sounds->contains(track.number))
+            bits += track.bitRate > 0 ? static_cast<double>(track.bitRate) : kUsual;
+    return bits;
 }
 
 /// The codec that the request comes to; nothing when the format cannot carry it, which the library tells.
@@ -61,6 +75,13 @@ std::optional<uint32_t> CodecOf(const Request& request, const FileFormatInfo& fo
     } catch (const Failure&) {
         return std::nullopt;
     }
+}
+
+void AskForSound(Request& request, const Wishes& wishes) {
+    request.noAudio = !wishes.withSound;
+    request.copySound = wishes.copySound.value_or(request.preferences.copySound);
+    if (!request.copySound)
+        request.channels = wishes.channels;
 }
 
 void AskForPictures(Request& request, const FileFormatInfo& format, const Preset& preset,
@@ -101,8 +122,7 @@ Request ToRequest(const Order& order) {
         request.length = *wishes.end - wishes.begin;
     request.split = wishes.clip;
     request.noVideo = !wishes.withPictures || order.facts.width == 0;
-    request.noAudio = !wishes.withSound;
-    request.channels = wishes.channels;
+    AskForSound(request, wishes);
     AskForTracksAndTexts(request, wishes);
     const FileFormatInfo* format = FindFormatOfFile(order.target);
     if (format == nullptr && wishes.format)
@@ -112,16 +132,16 @@ Request ToRequest(const Order& order) {
     request.format = format->fccFormat;
     request.noVideo = request.noVideo || format->bHasVideo == 0;
     request.noAudio = request.noAudio || format->bHasAudio == 0;
-    if (!request.noVideo)
+    if (request.noVideo)
+        request.burnSubtitles.clear();
+    else
         AskForPictures(request, *format, preset, order);
     return request;
 }
 
 double EstimatedRate(const Order& order, const Request& request) {
     const Preferences& preferences = request.preferences;
-    double bits = 0;
-    if (!request.noAudio && !preferences.noAudio)
-        bits += preferences.audioRate.At(request.channels.value_or(2)).value_or(128'000);
+    double bits = request.noAudio || preferences.noAudio ? 0 : SoundRate(order, request);
     if (request.noVideo || preferences.noVideo)
         return bits;
     if (preferences.videoRate)

@@ -2,6 +2,29 @@
 <!DOCTYPE TS>
 <TS version="2.1" language="de" sourcelanguage="en">
 <context>
+    <name>Codecs</name>
+    <message>
+        <source>timed text</source>
+        <translation>Zeittext</translation>
+    </message>
+    <message>
+        <source>plain text</source>
+        <translation>reiner Text</translation>
+    </message>
+    <message>
+        <source>uncompressed</source>
+        <translation>unkomprimiert</translation>
+    </message>
+    <message>
+        <source>mono</source>
+        <translation>Mono</translation>
+    </message>
+    <message>
+        <source>stereo</source>
+        <translation>Stereo</translation>
+    </message>
+</context>
+<context>
     <name>ConvertRunner</name>
     <message>
         <source>There was not enough memory.</source>
@@ -23,6 +46,9 @@
         <source>It was stopped before anything was converted.</source>
         <translation>Es wurde abgebrochen, bevor etwas umgewandelt war.</translation>
     </message>
+</context>
+<context>
+    <name>Foresight</name>
     <message>
         <source>The new file cannot take the place of its source. Choose another name.</source>
         <translation>Die neue Datei kann nicht an die Stelle ihrer Quelle treten. Bitte einen anderen Namen wählen.</translation>
@@ -36,20 +62,39 @@
         <translation>Die vorhandene Datei wird ersetzt.</translation>
     </message>
     <message>
-        <source>There is no folder “%1”.</source>
-        <translation>Den Ordner „%1“ gibt es nicht.</translation>
+        <source>The subtitles “%1” were not found.</source>
+        <translation>Die Untertitel „%1“ wurden nicht gefunden.</translation>
+    </message>
+    <message>
+        <source>The sound stays as it is, and so do its channels.</source>
+        <translation>Der Ton bleibt unverändert, und mit ihm seine Kanäle.</translation>
+    </message>
+    <message>
+        <source>Without pictures, no subtitles are drawn.</source>
+        <translation>Ohne Bilder werden keine Untertitel gezeichnet.</translation>
+    </message>
+    <message>
+        <source>Not carried over:</source>
+        <translation>Nicht übernommen:</translation>
     </message>
     <message>
         <source>About %1 are needed, but only %2 are free in “%3”.</source>
         <translation>Etwa %1 werden gebraucht, aber nur %2 sind in „%3“ frei.</translation>
     </message>
     <message>
-        <source>The subtitles “%1” were not found.</source>
-        <translation>Die Untertitel „%1“ wurden nicht gefunden.</translation>
+        <source>There is no folder “%1”.</source>
+        <translation>Den Ordner „%1“ gibt es nicht.</translation>
+    </message>
+</context>
+<context>
+    <name>FormParts</name>
+    <message>
+        <source>Subtitles</source>
+        <translation>Untertitel</translation>
     </message>
     <message>
-        <source>Not carried over:</source>
-        <translation>Nicht übernommen:</translation>
+        <source>All files</source>
+        <translation>Alle Dateien</translation>
     </message>
 </context>
 <context>
@@ -311,6 +356,203 @@
         <source>data</source>
         <translation>Daten</translation>
     </message>
+    <message>
+        <source>%1 cannot hold it as it is</source>
+        <translation>%1 kann ihn nicht unverändert aufnehmen</translation>
+    </message>
+    <message>
+        <source>%1 cannot hold its %2</source>
+        <translation>%1 kann davon nicht aufnehmen: %2</translation>
+    </message>
+    <message>
+        <source>%1 cannot hold one of %2 bytes</source>
+        <translation>%1 kann keines von %2 Byte aufnehmen</translation>
+    </message>
+    <message>
+        <source>%1 cannot hold “%2” sound as it is; no format can</source>
+        <translation>%1 kann Ton in „%2“ nicht unverändert aufnehmen, und kein anderes Format kann es</translation>
+    </message>
+    <message>
+        <source>%1 cannot hold “%2” sound as it is; %3 can</source>
+        <translation>%1 kann Ton in „%2“ nicht unverändert aufnehmen; diese können es: %3</translation>
+    </message>
+    <message>
+        <source>%1 cannot begin the sound as it is %2 s behind the pictures; MKV can</source>
+        <translation>%1 kann unveränderten Ton nicht %2 s nach den Bildern beginnen lassen; MKV kann es</translation>
+    </message>
+    <message>
+        <source>%1 cannot carry pictures as “%2”</source>
+        <translation>%1 kann keine Bilder in „%2“ aufnehmen</translation>
+    </message>
+    <message>
+        <source>%1 cannot carry sound as “%2”</source>
+        <translation>%1 kann keinen Ton in „%2“ aufnehmen</translation>
+    </message>
+    <message>
+        <source>%1 carries nothing that “%2” holds; choose another format</source>
+        <translation>%1 kann nichts von dem aufnehmen, was in „%2“ ist; bitte ein anderes Format wählen</translation>
+    </message>
+    <message>
+        <source>the extension of “%1” tells no file format</source>
+        <translation>die Endung von „%1“ nennt kein Dateiformat</translation>
+    </message>
+    <message>
+        <source>the begin, %1 s, is not before the end of “%2”, which is %3 s long</source>
+        <translation>der Anfang, %1 s, liegt nicht vor dem Ende von „%2“, das %3 s lang ist</translation>
+    </message>
+    <message>
+        <source>“%1” has pictures of %2 bits; HEVC, VP90 and AV01 have some of 10</source>
+        <translation>„%1“ hat Bilder mit %2 Bit; HEVC, VP90 und AV01 haben welche mit 10</translation>
+    </message>
+    <message>
+        <source>HDR needs pictures of 10 bits; “%1” has 8 here</source>
+        <translation>HDR braucht Bilder mit 10 Bit; „%1“ hat hier 8</translation>
+    </message>
+    <message>
+        <source>there is no sound “%1”; there is: %2</source>
+        <translation>es gibt keinen Ton „%1“; es gibt: %2</translation>
+    </message>
+    <message>
+        <source>there are no subtitles “%1”; there are: %2</source>
+        <translation>es gibt keine Untertitel „%1“; es gibt: %2</translation>
+    </message>
+    <message>
+        <source>the subtitles “%1” cannot be decoded</source>
+        <translation>die Untertitel „%1“ können nicht decodiert werden</translation>
+    </message>
+    <message>
+        <source>“%1” does not tell how long it is</source>
+        <translation>„%1“ sagt nicht, wie lang es ist</translation>
+    </message>
+    <message>
+        <source>“%1” is the source itself; give the output another name</source>
+        <translation>„%1“ ist die Quelle selbst; die neue Datei braucht einen anderen Namen</translation>
+    </message>
+    <message>
+        <source>“%1” is a folder; name a file in it</source>
+        <translation>„%1“ ist ein Ordner; bitte eine Datei darin nennen</translation>
+    </message>
+    <message>
+        <source>“%1” is not a file but a device or a pipe; name a file</source>
+        <translation>„%1“ ist keine Datei, sondern ein Gerät oder eine Pipe; bitte eine Datei nennen</translation>
+    </message>
+    <message>
+        <source>“%1” is not a folder</source>
+        <translation>„%1“ ist kein Ordner</translation>
+    </message>
+    <message>
+        <source>“%1” exists</source>
+        <translation>„%1“ gibt es schon</translation>
+    </message>
+    <message>
+        <source>the output&apos;s folder “%1” cannot be used: %2</source>
+        <translation>der Zielordner „%1“ ist nicht zu gebrauchen: %2</translation>
+    </message>
+    <message>
+        <source>cannot create files in “%1”: %2; choose another folder</source>
+        <translation>in „%1“ lassen sich keine Dateien anlegen: %2; bitte einen anderen Ordner wählen</translation>
+    </message>
+    <message>
+        <source>“%1” holds nothing to convert</source>
+        <translation>in „%1“ ist nichts, was sich umwandeln lässt</translation>
+    </message>
+    <message>
+        <source>cannot open “%1”: %2</source>
+        <translation>„%1“ lässt sich nicht öffnen: %2</translation>
+    </message>
+    <message>
+        <source>cannot read “%1”: %2</source>
+        <translation>„%1“ lässt sich nicht lesen: %2</translation>
+    </message>
+    <message>
+        <source>cannot read the streams of “%1”: %2</source>
+        <translation>die Spuren von „%1“ lassen sich nicht lesen: %2</translation>
+    </message>
+    <message>
+        <source>it is a text, not a movie</source>
+        <translation>es ist ein Text und kein Film</translation>
+    </message>
+    <message>
+        <source>it is not a movie, but says where to find one</source>
+        <translation>es ist kein Film, sondern sagt, wo einer zu finden ist</translation>
+    </message>
+    <message>
+        <source>it is a playlist, which names other files</source>
+        <translation>es ist eine Abspielliste, die andere Dateien nennt</translation>
+    </message>
+    <message>
+        <source>“%1” has changed meanwhile</source>
+        <translation>„%1“ hat sich inzwischen geändert</translation>
+    </message>
+    <message>
+        <source>reading “%1” failed after %2: %3; what was read is converted</source>
+        <translation>„%1“ war nur bis %2 zu lesen: %3; was gelesen wurde, ist umgewandelt</translation>
+    </message>
+    <message>
+        <source>the conversion broke off after %1</source>
+        <translation>die Umwandlung brach nach %1 ab</translation>
+    </message>
+    <message>
+        <source>cannot write “%1”: %2; what was written so far is in “%3”</source>
+        <translation>„%1“ lässt sich nicht schreiben: %2; was bisher geschrieben wurde, ist in „%3“</translation>
+    </message>
+    <message>
+        <source>cannot write “%1”: %2</source>
+        <translation>„%1“ lässt sich nicht schreiben: %2</translation>
+    </message>
+    <message>
+        <source>“%1” vanished while it was written: %2</source>
+        <translation>„%1“ verschwand, während es geschrieben wurde: %2</translation>
+    </message>
+    <message>
+        <source>“%1” was written but stands there no more: it vanished meanwhile</source>
+        <translation>„%1“ wurde geschrieben, ist aber inzwischen verschwunden</translation>
+    </message>
+    <message>
+        <source>“%1” was written, but another file stands there now</source>
+        <translation>„%1“ wurde geschrieben, aber jetzt liegt dort eine andere Datei</translation>
+    </message>
+    <message>
+        <source>“%1” needs about %2, but only %3 are free</source>
+        <translation>„%1“ braucht etwa %2, aber nur %3 sind frei</translation>
+    </message>
+    <message>
+        <source>no space is left for “%1”; waiting until there is room for %2</source>
+        <translation>für „%1“ ist kein Platz mehr; es wird gewartet, bis Platz für %2 ist</translation>
+    </message>
+    <message>
+        <source>no black borders were found</source>
+        <translation>schwarze Ränder wurden nicht gefunden</translation>
+    </message>
+    <message>
+        <source>%1 cannot hold %2</source>
+        <translation>%1 kann nicht aufnehmen: %2</translation>
+    </message>
+    <message>
+        <source>tags</source>
+        <translation>Texte</translation>
+    </message>
+    <message>
+        <source>label</source>
+        <translation>Beschriftung</translation>
+    </message>
+    <message>
+        <source>language</source>
+        <translation>Sprache</translation>
+    </message>
+    <message>
+        <source>title</source>
+        <translation>Titel</translation>
+    </message>
+    <message>
+        <source>flags</source>
+        <translation>Merkmale</translation>
+    </message>
+    <message>
+        <source>%1 and %2</source>
+        <comment>the last two of a list</comment>
+        <translation>%1 und %2</translation>
+    </message>
 </context>
 <context>
     <name>LogShare</name>
@@ -526,6 +768,76 @@
     </message>
 </context>
 <context>
+    <name>movieconv::window::BurnChoice</name>
+    <message>
+        <source>Subtitles drawn into the pictures</source>
+        <translation>Untertitel, die ins Bild gezeichnet werden</translation>
+    </message>
+    <message>
+        <source>They are seen on every player and cannot be switched off.</source>
+        <translation>Sie sind auf jedem Abspieler zu sehen und lassen sich nicht abschalten.</translation>
+    </message>
+    <message>
+        <source>A file…</source>
+        <translation>Datei…</translation>
+    </message>
+    <message>
+        <source>Draw the subtitles of a file</source>
+        <translation>Untertitel aus einer Datei ins Bild zeichnen</translation>
+    </message>
+    <message>
+        <source>Dra&amp;wn in</source>
+        <translation>Im &amp;Bild</translation>
+    </message>
+    <message>
+        <source>No subtitles</source>
+        <translation>Keine Untertitel</translation>
+    </message>
+    <message>
+        <source>Draw subtitles</source>
+        <translation>Untertitel ins Bild zeichnen</translation>
+    </message>
+</context>
+<context>
+    <name>movieconv::window::CropChoice</name>
+    <message>
+        <source>Crop</source>
+        <translation>Beschneiden</translation>
+    </message>
+    <message>
+        <source>Nothing</source>
+        <translation>Nichts</translation>
+    </message>
+    <message>
+        <source>Black borders</source>
+        <translation>Schwarze Ränder</translation>
+    </message>
+    <message>
+        <source>By hand</source>
+        <translation>Von Hand</translation>
+    </message>
+    <message>
+        <source>above</source>
+        <translation>oben</translation>
+    </message>
+    <message>
+        <source>below</source>
+        <translation>unten</translation>
+    </message>
+    <message>
+        <source>left</source>
+        <translation>links</translation>
+    </message>
+    <message>
+        <source>right</source>
+        <translation>rechts</translation>
+    </message>
+    <message>
+        <source>Pixels to cut off: %1</source>
+        <translation>Abzuschneidende Bildpunkte: %1</translation>
+    </message>
+</context>
+<context>
     <name>movieconv::window::EntryPage</name>
     <message>
         <source>Why it cannot be converted</source>
@@ -560,22 +872,6 @@
         <translation>Speichern als</translation>
     </message>
     <message>
-        <source>Begin of the range</source>
-        <translation>Anfang des Ausschnitts</translation>
-    </message>
-    <message>
-        <source>End of the range</source>
-        <translation>Ende des Ausschnitts</translation>
-    </message>
-    <message>
-        <source>Hours, minutes and seconds, such as 1:02:03</source>
-        <translation>Stunden, Minuten und Sekunden, etwa 1:02:03</translation>
-    </message>
-    <message>
-        <source>f&amp;rom</source>
-        <translation>v&amp;on</translation>
-    </message>
-    <message>
         <source>Sound tracks</source>
         <translation>Tonspuren</translation>
     </message>
@@ -584,32 +880,8 @@
         <translation>Untertitel</translation>
     </message>
     <message>
-        <source>File to save as</source>
-        <translation>Datei, in die gespeichert wird</translation>
-    </message>
-    <message>
-        <source>By the naming rules</source>
-        <translation>Nach den Namensregeln</translation>
-    </message>
-    <message>
-        <source>Back to the naming rules</source>
-        <translation>Zurück zu den Namensregeln</translation>
-    </message>
-    <message>
-        <source>Choose the file to save as</source>
-        <translation>Die Datei wählen, in die gespeichert wird</translation>
-    </message>
-    <message>
-        <source>Warnings</source>
-        <translation>Warnungen</translation>
-    </message>
-    <message>
-        <source>Replace the file that e&amp;xists</source>
-        <translation>Die vorhandene Datei ers&amp;etzen</translation>
-    </message>
-    <message>
         <source>&amp;Use for all that wait</source>
-        <translation>Für &amp;alle Wartenden verwenden</translation>
+        <translation>Für &amp;alle verwenden</translation>
     </message>
     <message>
         <source>Gives every waiting movie these settings; ranges and tracks stay as they are.</source>
@@ -617,7 +889,7 @@
     </message>
     <message>
         <source>Sa&amp;ve as preset…</source>
-        <translation>Als Vorlage &amp;speichern …</translation>
+        <translation>Vorlage &amp;speichern …</translation>
     </message>
     <message>
         <source>As the source</source>
@@ -656,10 +928,6 @@
         <translation>Gute Bilder</translation>
     </message>
     <message>
-        <source>Notes</source>
-        <translation>Hinweise</translation>
-    </message>
-    <message>
         <source>&amp;Preset</source>
         <translation>Vo&amp;rlage</translation>
     </message>
@@ -668,20 +936,63 @@
         <translation>&amp;Qualität</translation>
     </message>
     <message>
-        <source>&amp;to</source>
-        <translation>b&amp;is</translation>
-    </message>
-    <message>
-        <source>Choos&amp;e…</source>
-        <translation>Wäh&amp;len …</translation>
-    </message>
-    <message>
         <source>&amp;Load preset…</source>
         <translation>&amp;Vorlage laden …</translation>
     </message>
     <message>
         <source>Preset</source>
         <translation>Vorlage</translation>
+    </message>
+    <message>
+        <source>Crop</source>
+        <translation>Beschneiden</translation>
+    </message>
+    <message>
+        <source>Cut &amp;into clips</source>
+        <translation>In &amp;Clips teilen</translation>
+    </message>
+    <message>
+        <source>Writes several files, each of that length.</source>
+        <translation>Schreibt mehrere Dateien von dieser Länge.</translation>
+    </message>
+    <message>
+        <source>Repairs the combs of old television pictures.</source>
+        <translation>Beseitigt die Kammstreifen alter Fernsehbilder.</translation>
+    </message>
+    <message>
+        <source>Deinterlacin&amp;g</source>
+        <translation>Zeilens&amp;prung entfernen</translation>
+    </message>
+    <message>
+        <source>Leave the sound as it is</source>
+        <translation>Ton unverändert lassen</translation>
+    </message>
+    <message>
+        <source>Sound is not converted but taken over: without loss, with its own channels.</source>
+        <translation>Der Ton wird nicht umgewandelt, sondern übernommen: ohne Verlust, mit seinen eigenen Kanälen.</translation>
+    </message>
+    <message>
+        <source>No, one file</source>
+        <translation>Nein, eine Datei</translation>
+    </message>
+    <message numerus="yes">
+        <source>Of %n minutes</source>
+        <translation>
+            <numerusform>Von einer Minute</numerusform>
+            <numerusform>Von %n Minuten</numerusform>
+        </translation>
+    </message>
+    <message>
+        <source>Where the source says so</source>
+        <translation>Wo die Quelle es angibt</translation>
+    </message>
+    <message>
+        <source>Never</source>
+        <translation>Nie</translation>
+    </message>
+    <message>
+        <source>Everything</source>
+        <translation>Alles</translation>
     </message>
 </context>
 <context>
@@ -871,7 +1182,7 @@
     </message>
     <message>
         <source>Convert &amp;again</source>
-        <translation>Noch &amp;einmal umwandeln</translation>
+        <translation>&amp;Erneut umwandeln</translation>
     </message>
     <message>
         <source>Ctrl+R</source>
@@ -998,7 +1309,7 @@
     </message>
     <message>
         <source>A&amp;dd movies…</source>
-        <translation>Filme hinz&amp;ufügen …</translation>
+        <translation>Filme hin&amp;zufügen …</translation>
     </message>
     <message>
         <source>Pause</source>
@@ -1056,22 +1367,6 @@
         <translation>Tonkanäle</translation>
     </message>
     <message>
-        <source>Cut &amp;into clips</source>
-        <translation>In &amp;Clips teilen</translation>
-    </message>
-    <message>
-        <source>Writes several files, each of that length.</source>
-        <translation>Schreibt mehrere Dateien von dieser Länge.</translation>
-    </message>
-    <message>
-        <source>Deinterlacin&amp;g</source>
-        <translation>Zeilens&amp;prung entfernen</translation>
-    </message>
-    <message>
-        <source>Repairs the combs of old television pictures.</source>
-        <translation>Beseitigt die Kammstreifen alter Fernsehbilder.</translation>
-    </message>
-    <message>
         <source>HDR pictures</source>
         <translation>HDR-Bilder</translation>
     </message>
@@ -1100,30 +1395,6 @@
         <translation>Umwandeln</translation>
     </message>
     <message>
-        <source>Crop</source>
-        <translation>Beschneiden</translation>
-    </message>
-    <message>
-        <source>above</source>
-        <translation>oben</translation>
-    </message>
-    <message>
-        <source>below</source>
-        <translation>unten</translation>
-    </message>
-    <message>
-        <source>left</source>
-        <translation>links</translation>
-    </message>
-    <message>
-        <source>right</source>
-        <translation>rechts</translation>
-    </message>
-    <message>
-        <source>Pixels to cut off: %1</source>
-        <translation>Abzuschneidende Bildpunkte: %1</translation>
-    </message>
-    <message>
         <source>As the source</source>
         <translation>Wie die Quelle</translation>
     </message>
@@ -1138,41 +1409,6 @@
     <message>
         <source>Stereo</source>
         <translation>Stereo</translation>
-    </message>
-    <message>
-        <source>No, one file</source>
-        <translation>Nein, eine Datei</translation>
-    </message>
-    <message numerus="yes">
-        <source>Of %n minutes</source>
-        <translation>
-            <numerusform>Von einer Minute</numerusform>
-            <numerusform>Von %n Minuten</numerusform>
-        </translation>
-    </message>
-    <message>
-        <source>Where the source says so</source>
-        <translation>Wo die Quelle es angibt</translation>
-    </message>
-    <message>
-        <source>Never</source>
-        <translation>Nie</translation>
-    </message>
-    <message>
-        <source>Everything</source>
-        <translation>Alles</translation>
-    </message>
-    <message>
-        <source>Nothing</source>
-        <translation>Nichts</translation>
-    </message>
-    <message>
-        <source>Black borders</source>
-        <translation>Schwarze Ränder</translation>
-    </message>
-    <message>
-        <source>By hand</source>
-        <translation>Von Hand</translation>
     </message>
     <message>
         <source>Kept where the format can</source>
@@ -1197,6 +1433,10 @@
     <message>
         <source>Keep title, date and other texts</source>
         <translation>Titel, Datum und andere Te&amp;xte behalten</translation>
+    </message>
+    <message>
+        <source>The sound stays as it is, and so do its channels.</source>
+        <translation>Der Ton bleibt unverändert, und mit ihm seine Kanäle.</translation>
     </message>
 </context>
 <context>
@@ -1307,7 +1547,7 @@
     </message>
     <message>
         <source>Convert &amp;again</source>
-        <translation>Noch &amp;einmal umwandeln</translation>
+        <translation>&amp;Erneut umwandeln</translation>
     </message>
     <message>
         <source>What became of the movie</source>
@@ -1350,6 +1590,29 @@
     <message>
         <source>Movies to convert</source>
         <translation>Filme zum Umwandeln</translation>
+    </message>
+</context>
+<context>
+    <name>movieconv::window::RangeChoice</name>
+    <message>
+        <source>Begin of the range</source>
+        <translation>Anfang des Ausschnitts</translation>
+    </message>
+    <message>
+        <source>End of the range</source>
+        <translation>Ende des Ausschnitts</translation>
+    </message>
+    <message>
+        <source>f&amp;rom</source>
+        <translation>v&amp;on</translation>
+    </message>
+    <message>
+        <source>&amp;to</source>
+        <translation>b&amp;is</translation>
+    </message>
+    <message>
+        <source>Hours, minutes and seconds, such as 1:02:03</source>
+        <translation>Stunden, Minuten und Sekunden, etwa 1:02:03</translation>
     </message>
 </context>
 <context>
@@ -1404,13 +1667,44 @@
         <source>Add subtitles</source>
         <translation>Untertitel hinzufügen</translation>
     </message>
+</context>
+<context>
+    <name>movieconv::window::TargetChoice</name>
     <message>
-        <source>Subtitles</source>
-        <translation>Untertitel</translation>
+        <source>Choos&amp;e…</source>
+        <translation>Wäh&amp;len …</translation>
     </message>
     <message>
-        <source>All files</source>
-        <translation>Alle Dateien</translation>
+        <source>Replace the file that e&amp;xists</source>
+        <translation>Die vorhandene Datei ers&amp;etzen</translation>
+    </message>
+    <message>
+        <source>File to save as</source>
+        <translation>Datei, in die gespeichert wird</translation>
+    </message>
+    <message>
+        <source>By the naming rules</source>
+        <translation>Nach den Namensregeln</translation>
+    </message>
+    <message>
+        <source>Back to the naming rules</source>
+        <translation>Zurück zu den Namensregeln</translation>
+    </message>
+    <message>
+        <source>Choose the file to save as</source>
+        <translation>Die Datei wählen, in die gespeichert wird</translation>
+    </message>
+    <message>
+        <source>Warnings</source>
+        <translation>Warnungen</translation>
+    </message>
+    <message>
+        <source>Notes</source>
+        <translation>Hinweise</translation>
+    </message>
+    <message>
+        <source>Save as</source>
+        <translation>Speichern als</translation>
     </message>
 </context>
 <context>

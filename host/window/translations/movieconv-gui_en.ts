@@ -29,6 +29,16 @@
     </message>
 </context>
 <context>
+    <name>movieconv::window::EntryPage</name>
+    <message numerus="yes">
+        <source>Of %n minutes</source>
+        <translation>
+            <numerusform>Of one minute</numerusform>
+            <numerusform>Of %n minutes</numerusform>
+        </translation>
+    </message>
+</context>
+<context>
     <name>movieconv::window::LogPanel</name>
     <message numerus="yes">
         <source>&amp;Log (%n lines)</source>
@@ -66,16 +76,6 @@
         <translation>
             <numerusform>One movie</numerusform>
             <numerusform>%n movies</numerusform>
-        </translation>
-    </message>
-</context>
-<context>
-    <name>movieconv::window::MoreSettings</name>
-    <message numerus="yes">
-        <source>Of %n minutes</source>
-        <translation>
-            <numerusform>Of one minute</numerusform>
-            <numerusform>Of %n minutes</numerusform>
         </translation>
     </message>
 </context>

@@ -1,6 +1,5 @@
 #include "host/window/widgets/EntryDelegate.h"
 
-#include "host/window/model/Words.h"
 #include "host/window/widgets/Icons.h"
 #include "host/window/widgets/Look.h"
 
@@ -103,7 +102,7 @@ void EntryDelegate::paint(QPainter* painter, const QStyleOptionViewItem& option,
     painter->setPen(entry.state == State::kFailed ? BadColour(palette) : DimColour(palette));
     painter->drawText(QRect(left, top + strongMetrics.height() + 2, width, metrics.height()),
                       Qt::AlignLeft | Qt::AlignVCenter,
-                      metrics.elidedText(StateLine(entry).simplified(), Qt::ElideRight, width));
+                      metrics.elidedText(queue_.LineOf(entry).simplified(), Qt::ElideRight, width));
     if (entry.state == State::kActive)
         PaintBar(*painter, QRect(left, card.bottom() - kBarHeight - 4, width, kBarHeight), entry, palette);
     painter->restore();

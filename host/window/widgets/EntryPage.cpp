@@ -1,32 +1,29 @@
 #include "host/window/widgets/EntryPage.h"
 
 #include "host/window/model/Words.h"
+#include "host/window/widgets/BurnChoice.h"
+#include "host/window/widgets/CropChoice.h"
 #include "host/window/widgets/FormParts.h"
-#include "host/window/widgets/Icons.h"
 #include "host/window/widgets/Look.h"
 #include "host/window/widgets/MoreSettings.h"
-#include "host/window/widgets/RangeStrip.h"
+#include "host/window/widgets/RangeChoice.h"
 #include "host/window/widgets/SubtitleFiles.h"
+#include "host/window/widgets/TargetChoice.h"
 #include "host/window/widgets/TrackChoice.h"
 
-#include <QApplication>
 #include <QCheckBox>
-#include <QFileDialog>
-#include <QLineEdit>
 #include <QPushButton>
 #include <QScrollArea>
 #include <QSlider>
-#include <QToolButton>
 
 #include <algorithm>
 #include <array>
-#include <stdexcept>
 
 namespace movieconv::window {
 namespace {
 
-constexpr int kStripWidth = 160; // of one of its pictures, in pixels
 constexpr std::array kHeights = {2160, 1440, 1080, 720, 576, 480, 360};
+constexpr std::array kClipMinutes = {1, 5, 10, 15, 30, 60};
 
 /// Of a row whose first line is a box to tick.
 int HeightOfTick() {
@@ -48,31 +45,22 @@ EntryPage::EntryPage(Runner& runner, QWidget* parent)
     layout->addLayout(MakeHead());
     layout->addWidget(body_);
     layout->addStretch(1);
-    auto* body = new QVBoxLayout(body_);
-    body->setContentsMargins(0, 0, 0, 0);
-    body->setSpacing(14);
+    QVBoxLayout* body = MakeColumn(*body_, 14);
     body->addLayout(MakeForm());
-    more_ = new MoreSettings(abilities_);
+    more_ = new MoreSettings;
     body->addWidget(more_);
     body->addLayout(MakeFoot());
     scroll->setWidget(page);
-    auto* outer = new QVBoxLayout(this);
-    outer->setContentsMargins(0, 0, 0, 0);
-    outer->addWidget(scroll);
+    MakeColumn(*this, 0)->addWidget(scroll);
     FillPresets();
     FillChoices();
     Connect();
 }
 
-EntryPage::~EntryPage() = default;
-
 QLayout* EntryPage::MakeHead() {
     title_ = MakeTitle({}, 1.5, true);
     facts_ = MakeHint();
-    unusable_ = new QLabel;
-    unusable_->setWordWrap(true);
-    unusable_->setMinimumWidth(1); // a long path is cut and does not widen the page
-    unusable_->setTextFormat(Qt::PlainText);
+    unusable_ = MakeRemark(&BadColour);
     unusable_->setAccessibleName(tr("Why it cannot be converted"));
     auto* head = new QVBoxLayout;
     head->setSpacing(4);
@@ -83,124 +71,90 @@ QLayout* EntryPage::MakeHead() {
 }
 
 QFormLayout* EntryPage::MakeForm() {
-    preset_ = new QComboBox;
-    description_ = MakeHint();
-    description_->setWordWrap(false); // the form keeps a second line's room once it had one
-    description_->setMinimumWidth(1);
     format_ = new QComboBox;
     size_ = new QComboBox;
-    quality_ = new QSlider(Qt::Horizontal);
-    quality_->setRange(0, 100);
-    quality_->setPageStep(10);
-    qualityWords_ = MakeHint();
-    qualityWords_->setWordWrap(false);
-    qualityWords_->setMinimumWidth(fontMetrics().horizontalAdvance(tr("As the preset has it")) + 8);
+    crop_ = new CropChoice;
+    deinterlace_ = new QComboBox;
+    range_ = new RangeChoice(runner_);
+    clip_ = new QComboBox;
+    target_ = new TargetChoice;
     auto* form = new QFormLayout;
     form->setHorizontalSpacing(16);
     form->setVerticalSpacing(10);
     form->setFieldGrowthPolicy(QFormLayout::AllNonFixedFieldsGrow);
     form->setLabelAlignment(Qt::AlignRight | Qt::AlignVCenter);
+    QLayout* preset = MakePreset();
+    form->addRow(MakeRowLabel(tr("&Preset"), preset_), preset);
+    AddRow(*form, tr("&File format"), format_);
+    AddRow(*form, tr("Picture &size"), size_);
+    form->addRow(MakeRowLabel(tr("Crop"), crop_->Box()), crop_);
+    AddRow(*form, tr("Deinterlacin&g"), deinterlace_, tr("Repairs the combs of old television pictures."));
+    QLayout* quality = MakeQuality();
+    auto* label = new QLabel(tr("Qualit&y"));
+    label->setBuddy(quality_);
+    form->addRow(label, quality);
+    form->addRow(new QLabel(tr("Range")), range_);
+    AddRow(*form, tr("Cut &into clips"), clip_, tr("Writes several files, each of that length."));
+    AddTracks(*form);
+    form->addRow(MakeRowLabel(tr("Save as"), target_->Button()), target_);
+    form->setRowVisible(crop_, abilities_.crop);
+    form->setRowVisible(deinterlace_, abilities_.deinterlace);
+    return form;
+}
+
+QLayout* EntryPage::MakePreset() {
+    preset_ = new QComboBox;
+    AllowNarrow(*preset_);
+    preset_->setAccessibleName(tr("Preset"));
+    description_ = MakeHint();
+    description_->setWordWrap(false); // the form keeps a second line's room once it had one
+    description_->setMinimumWidth(1);
     auto* preset = new QVBoxLayout;
     preset->setSpacing(4);
     preset->addWidget(preset_);
     preset->addWidget(description_);
-    preset_->setAccessibleName(tr("Preset"));
-    form->addRow(MakeRowLabel(tr("&Preset"), preset_), preset);
-    AddRow(*form, tr("&File format"), format_);
-    AddRow(*form, tr("Picture &size"), size_);
+    return preset;
+}
+
+QLayout* EntryPage::MakeQuality() {
+    quality_ = new QSlider(Qt::Horizontal);
+    quality_->setRange(0, 100);
+    quality_->setPageStep(10);
+    quality_->setAccessibleName(tr("Quality"));
+    quality_->setToolTip(tr("To the left small files, to the right good pictures."));
+    quality_->setAccessibleDescription(quality_->toolTip());
+    qualityWords_ = MakeHint();
+    qualityWords_->setWordWrap(false);
+    qualityWords_->setMinimumWidth(fontMetrics().horizontalAdvance(tr("As the preset has it")) + 8);
     auto* quality = new QHBoxLayout;
     quality->setSpacing(14);
     quality->addWidget(quality_, 1);
     quality->addWidget(qualityWords_);
-    auto* label = new QLabel(tr("Qualit&y"));
-    label->setBuddy(quality_);
-    quality_->setAccessibleName(tr("Quality"));
-    quality_->setToolTip(tr("To the left small files, to the right good pictures."));
-    quality_->setAccessibleDescription(quality_->toolTip());
-    form->addRow(label, quality);
-    form->addRow(new QLabel(tr("Range")), MakeRange());
-    AddTracks(form);
-    QWidget* target = MakeTarget();
-    form->addRow(MakeRowLabel(tr("Save as"), browse_), target);
-    return form;
+    return quality;
 }
 
-QWidget* EntryPage::MakeRange() {
-    strip_ = new RangeStrip;
-    begin_ = new QLineEdit;
-    end_ = new QLineEdit;
-    begin_->setAccessibleName(tr("Begin of the range"));
-    end_->setAccessibleName(tr("End of the range"));
-    for (QLineEdit* edit : {begin_, end_}) {
-        edit->setMaximumWidth(fontMetrics().horizontalAdvance(QStringLiteral("00:00:00.000")) + 24);
-        edit->setToolTip(tr("Hours, minutes and seconds, such as 1:02:03"));
-        edit->setAccessibleDescription(edit->toolTip());
-    }
-    auto* times = new QHBoxLayout;
-    auto* from = new QLabel(tr("f&rom"));
-    from->setBuddy(begin_);
-    auto* to = new QLabel(tr("&to"));
-    to->setBuddy(end_);
-    times->addWidget(from);
-    times->addWidget(begin_);
-    times->addWidget(to);
-    times->addWidget(end_);
-    times->addStretch();
-    auto* range = new QWidget;
-    auto* layout = new QVBoxLayout(range);
-    layout->setContentsMargins(0, 0, 0, 0);
-    layout->setSpacing(6);
-    layout->addWidget(strip_);
-    layout->addLayout(times);
-    return range;
-}
-
-void EntryPage::AddTracks(QFormLayout* form) {
+void EntryPage::AddTracks(QFormLayout& form) {
     sounds_ = new TrackChoice(tr("Sound tracks"));
+    copySound_ = new QCheckBox(tr("Leave the sound as it is"));
+    copySound_->setToolTip(tr("Sound is not converted but taken over: without loss, with its own channels."));
+    copySound_->setAccessibleDescription(copySound_->toolTip());
     subtitles_ = new TrackChoice(tr("Subtitles"));
+    burning_ = new BurnChoice;
     subtitleFiles_ = new SubtitleFiles;
+    auto* sound = new QWidget;
+    QVBoxLayout* layout = MakeColumn(*sound, 6);
+    layout->addWidget(sounds_);
+    layout->addWidget(copySound_);
     auto* texts = new QWidget;
-    auto* layout = new QVBoxLayout(texts);
-    layout->setContentsMargins(0, 0, 0, 0);
-    layout->setSpacing(6);
+    layout = MakeColumn(*texts, 6);
     layout->addWidget(subtitles_);
     layout->addWidget(subtitleFiles_);
+    layout->addWidget(burning_);
     soundsLabel_ = new QLabel(tr("Sound tracks"));
     soundsLabel_->setFixedHeight(HeightOfTick());
     subtitlesLabel_ = new QLabel(tr("Subtitles"));
-    form->addRow(soundsLabel_, sounds_);
-    form->addRow(subtitlesLabel_, texts);
-}
-
-QWidget* EntryPage::MakeTarget() {
-    target_ = new QLineEdit;
-    target_->setAccessibleName(tr("File to save as"));
-    target_->setPlaceholderText(tr("By the naming rules"));
-    target_->setClearButtonEnabled(true);
-    for (QToolButton* clear : target_->findChildren<QToolButton*>())
-        clear->setAccessibleName(tr("Back to the naming rules"));
-    browse_ = new QPushButton(IconOf(Sign::kFolder), tr("Choos&e…"));
-    browse_->setAccessibleName(tr("Choose the file to save as"));
-    findings_ = new QLabel;
-    findings_->setWordWrap(true);
-    findings_->setMinimumWidth(1);
-    findings_->setTextFormat(Qt::PlainText);
-    findings_->setAccessibleName(tr("Warnings"));
-    notes_ = MakeHint();
-    notes_->setAccessibleName(tr("Notes"));
-    replace_ = new QCheckBox(tr("Replace the file that e&xists"));
-    auto* row = new QHBoxLayout;
-    row->addWidget(target_, 1);
-    row->addWidget(browse_);
-    auto* target = new QWidget;
-    auto* layout = new QVBoxLayout(target);
-    layout->setContentsMargins(0, 0, 0, 0);
-    layout->setSpacing(6);
-    layout->addLayout(row);
-    layout->addWidget(findings_);
-    layout->addWidget(notes_);
-    layout->addWidget(replace_);
-    return target;
+    form.addRow(soundsLabel_, sound);
+    form.addRow(subtitlesLabel_, texts);
 }
 
 QLayout* EntryPage::MakeFoot() {
@@ -238,6 +192,12 @@ void EntryPage::FillChoices() {
     size_->addItem(tr("As the source"));
     for (const int height : kHeights)
         size_->addItem(tr("%1 lines").arg(height), height);
+    clip_->addItem(tr("No, one file"));
+    for (const int minutes : kClipMinutes)
+        clip_->addItem(tr("Of %n minutes", "", minutes), minutes * 60.0);
+    deinterlace_->addItem(tr("Where the source says so"), static_cast<int>(Wishes::Deinterlace::kAuto));
+    deinterlace_->addItem(tr("Never"), static_cast<int>(Wishes::Deinterlace::kOff));
+    deinterlace_->addItem(tr("Everything"), static_cast<int>(Wishes::Deinterlace::kAll));
 }
 
 void EntryPage::Connect() {
@@ -250,12 +210,48 @@ void EntryPage::Connect() {
     });
     connect(format_, &QComboBox::activated, this,
             [this] { Choose([this](Wishes& wishes) { wishes.format = ValueOf<QString>(*format_); }); });
-    connect(size_, &QComboBox::activated, this,
-            [this] { Choose([this](Wishes& wishes) { wishes.height = ValueOf<int>(*size_); }); });
     connect(quality_, &QSlider::valueChanged, this,
             [this](int value) { Choose([value](Wishes& wishes) { wishes.quality = value; }); });
+    connect(more_, &MoreSettings::Chosen, this,
+            [this](const Wishes& chosen) { Choose([&](Wishes& wishes) { wishes = chosen; }); });
+    connect(target_, &TargetChoice::PathChosen, this, &EntryPage::TargetChosen);
+    connect(target_, &TargetChoice::ReplaceChosen, this, &EntryPage::ReplaceChosen);
+    ConnectPictures();
+    ConnectTracks();
+}
+
+void EntryPage::ConnectPictures() {
+    connect(size_, &QComboBox::activated, this,
+            [this] { Choose([this](Wishes& wishes) { wishes.height = ValueOf<int>(*size_); }); });
+    connect(crop_, &CropChoice::Chosen, this, [this](bool borders, const std::optional<Margins>& cut) {
+        Choose([&](Wishes& wishes) {
+            wishes.crop = borders;
+            wishes.cut = cut;
+        });
+    });
+    connect(deinterlace_, &QComboBox::activated, this, [this] {
+        Choose([this](Wishes& wishes) {
+            wishes.deinterlace = static_cast<Wishes::Deinterlace>(deinterlace_->currentData().toInt());
+        });
+    });
+    connect(range_, &RangeChoice::Chosen, this, [this](double begin, std::optional<double> end) {
+        Choose([&](Wishes& wishes) {
+            wishes.begin = begin;
+            wishes.end = end;
+        });
+    });
+    connect(clip_, &QComboBox::activated, this,
+            [this] { Choose([this](Wishes& wishes) { wishes.clip = ValueOf<double>(*clip_); }); });
+}
+
+void EntryPage::ConnectTracks() {
     connect(sounds_, &TrackChoice::Chosen, this, [this](const std::optional<QList<int>>& numbers) {
         Choose([&](Wishes& wishes) { wishes.sounds = numbers; });
+    });
+    connect(copySound_, &QCheckBox::toggled, this, [this](bool on) {
+        Choose([&](Wishes& wishes) {
+            wishes.copySound = on == CopiesSound(Wishes()) ? std::nullopt : std::optional(on);
+        });
     });
     connect(subtitles_, &TrackChoice::Chosen, this, [this](const std::optional<QList<int>>& numbers) {
         Choose([&](Wishes& wishes) { wishes.subtitles = numbers; });
@@ -263,30 +259,11 @@ void EntryPage::Connect() {
     connect(subtitleFiles_, &SubtitleFiles::Chosen, this, [this](const std::vector<SubtitleFile>& files) {
         Choose([&](Wishes& wishes) { wishes.subtitleFiles = files; });
     });
-    connect(more_, &MoreSettings::Chosen, this,
-            [this](const Wishes& chosen) { Choose([&](Wishes& wishes) { wishes = chosen; }); });
-    connect(strip_, &RangeStrip::RangeChosen, this, [this](double begin, std::optional<double> end) {
-        Choose([&](Wishes& wishes) {
-            wishes.begin = begin;
-            wishes.end = end;
-        });
-    });
-    connect(begin_, &QLineEdit::editingFinished, this, &EntryPage::ChooseTimes);
-    connect(end_, &QLineEdit::editingFinished, this, &EntryPage::ChooseTimes);
-    connect(target_, &QLineEdit::editingFinished, this, [this] {
-        if (target_->isModified())
-            Q_EMIT TargetChosen(entry_.id, target_->text().toStdString());
-    });
-    connect(browse_, &QPushButton::clicked, this, &EntryPage::BrowseTarget);
-    connect(replace_, &QCheckBox::toggled, this, [this](bool on) {
-        if (!filling_)
-            Q_EMIT ReplaceChosen(entry_.id, on);
-    });
+    connect(burning_, &BurnChoice::Chosen, this,
+            [this](const Burning& burning) { Choose([&](Wishes& wishes) { Burn(wishes, burning); }); });
 }
 
 void EntryPage::Show(const Entry& entry) {
-    const bool other = entry.id != entry_.id;
-    const bool found = entry.facts.has_value() && (other || !entry_.facts);
     entry_ = entry;
     filling_ = true;
     SetTitle(*title_, NameOf(entry.source).simplified());
@@ -295,12 +272,8 @@ void EntryPage::Show(const Entry& entry) {
     unusable_->setText(entry.unusable);
     unusable_->setVisible(!entry.unusable.isEmpty());
     body_->setVisible(entry.unusable.isEmpty());
-    if (other || found) {
-        strip_->SetLength(entry.facts ? entry.facts->seconds : 0);
-        AskForPictures();
-    }
     ShowWishes();
-    ShowFindings();
+    target_->Show(entry);
     filling_ = false;
 }
 
@@ -325,12 +298,12 @@ void EntryPage::ShowWishes() {
                            : *wishes.quality < 35 ? tr("Small file")
                            : *wishes.quality < 70 ? tr("Balanced")
                                                   : tr("Good pictures"));
-    strip_->SetRange(wishes.begin, wishes.end);
-    const double length = entry_.facts ? entry_.facts->seconds : 0;
-    begin_->setText(ClockText(wishes.begin));
-    end_->setText(wishes.end ? ClockText(*wishes.end) : length > 0 ? ClockText(length) : QString());
+    crop_->Show(wishes, entry_.facts ? &*entry_.facts : nullptr);
+    ChooseItem(*deinterlace_, static_cast<int>(wishes.deinterlace));
+    range_->Show(entry_);
+    ChooseItem(*clip_, DataOf(wishes.clip));
     ShowTracks();
-    more_->Show(wishes, entry_.facts ? &*entry_.facts : nullptr);
+    more_->Show(wishes, entry_.facts ? &*entry_.facts : nullptr, CopiesSound(wishes));
 }
 
 void EntryPage::ShowTracks() {
@@ -338,53 +311,24 @@ void EntryPage::ShowTracks() {
     const std::vector<TrackFacts> none;
     const std::vector<TrackFacts>& sounds = known ? entry_.facts->sounds : none;
     const std::vector<TrackFacts>& subtitles = known ? entry_.facts->subtitles : none;
-    sounds_->Show(sounds, entry_.wishes.sounds);
-    sounds_->setVisible(!sounds.empty());
-    sounds_->setEnabled(entry_.wishes.withSound);
-    soundsLabel_->setVisible(!sounds.empty());
-    subtitles_->Show(subtitles, entry_.wishes.subtitles);
-    subtitles_->setVisible(!subtitles.empty());
-    subtitleFiles_->Show(entry_.wishes.subtitleFiles, entry_.source);
-    subtitleFiles_->setVisible(known);
-    subtitlesLabel_->setVisible(known);
-    subtitlesLabel_->setFixedHeight(subtitles.empty() ? browse_->sizeHint().height() : HeightOfTick());
-}
-
-void EntryPage::ShowFindings() {
-    if (!target_->hasFocus() || !target_->isModified())
-        target_->setText(Readable(entry_.target));
-    target_->setCursorPosition(static_cast<int>(target_->text().size()));
-    findings_->setText(entry_.findings.warnings.join(QLatin1Char('\n')));
-    findings_->setVisible(!entry_.findings.warnings.isEmpty());
-    notes_->setText(entry_.findings.notes.join(QLatin1Char('\n')));
-    notes_->setVisible(!entry_.findings.notes.isEmpty());
-    QPalette colours = QApplication::palette();
-    colours.setColor(QPalette::WindowText, WarningColour(colours));
-    findings_->setPalette(colours);
-    colours.setColor(QPalette::WindowText, BadColour(colours));
-    unusable_->setPalette(colours);
-    replace_->setChecked(entry_.replace);
-    replace_->setVisible(entry_.findings.targetExists);
-}
-
-void EntryPage::AskForPictures() {
-    worker_.Forget();
-    if (!entry_.facts || entry_.facts->width == 0)
-        return;
-    for (int i = 0; i < RangeStrip::kPictures; ++i) {
-        worker_.Do(0, [this, i, id = entry_.id, path = entry_.source, seconds = strip_->TimeOf(i)] {
-            QImage picture;
-            try {
-                picture = runner_.PictureAt(path, seconds, kStripWidth);
-            } catch (const std::runtime_error&) {
-                return; // the strip stays empty there
-            }
-            QMetaObject::invokeMethod(this, [this, i, id, picture] {
-                if (id == entry_.id)
-                    strip_->SetPicture(i, picture);
-            });
-        });
+    const Wishes& wishes = entry_.wishes;
+    sounds_->Show(sounds, wishes.sounds);
+    copySound_->setChecked(CopiesSound(wishes));
+    for (QWidget* part : std::initializer_list<QWidget*>{sounds_, copySound_}) {
+        part->setVisible(!sounds.empty());
+        part->setEnabled(wishes.withSound);
     }
+    soundsLabel_->setVisible(!sounds.empty());
+    subtitles_->Show(subtitles, wishes.subtitles, wishes.burning.track);
+    subtitles_->setVisible(!subtitles.empty());
+    subtitleFiles_->Show(wishes.subtitleFiles, entry_.source);
+    subtitleFiles_->setVisible(known);
+    burning_->Show(subtitles, wishes.burning, entry_.source);
+    burning_->setVisible(known && entry_.facts->width > 0);
+    burning_->setEnabled(wishes.withPictures);
+    subtitlesLabel_->setVisible(known);
+    subtitlesLabel_->setFixedHeight(subtitles.empty() ? target_->Button()->sizeHint().height()
+                                                      : HeightOfTick());
 }
 
 void EntryPage::Choose(const std::function<void(Wishes&)>& change) {
@@ -396,39 +340,16 @@ void EntryPage::Choose(const std::function<void(Wishes&)>& change) {
         Q_EMIT WishesChosen(entry_.id, wishes);
 }
 
-void EntryPage::ChooseTimes() {
-    Choose([this](Wishes& wishes) {
-        const double length = entry_.facts && entry_.facts->lengthKnown ? entry_.facts->seconds : 1e7;
-        const std::optional<double> begin = ParseClock(begin_->text());
-        const std::optional<double> end = ParseClock(end_->text());
-        if (begin_->isModified() && begin && *begin < length)
-            wishes.begin = *begin;
-        if (end_->isModified())
-            wishes.end = end && *end<length&& * end> wishes.begin ? end : std::nullopt;
-        if (wishes.end && wishes.begin >= *wishes.end)
-            wishes.end.reset();
-    });
-    filling_ = true; // what made no sense goes back to what holds
-    ShowWishes();
-    filling_ = false;
-}
-
-void EntryPage::BrowseTarget() {
-    auto* dialog = new QFileDialog(this, tr("Save as"), QString(), QString());
-    dialog->setAttribute(Qt::WA_DeleteOnClose);
-    dialog->setAcceptMode(QFileDialog::AcceptSave);
-    dialog->setOption(QFileDialog::DontConfirmOverwrite); // the page warns
-    dialog->selectFile(Readable(entry_.target));
-    connect(dialog, &QFileDialog::fileSelected, this,
-            [this, id = entry_.id](const QString& path) { Q_EMIT TargetChosen(id, path.toStdString()); });
-    dialog->show();
-}
-
 const PresetFacts* EntryPage::CurrentPreset() const {
     const auto found = std::find_if(presets_.begin(), presets_.end(), [this](const PresetFacts& preset) {
         return preset.name == entry_.wishes.preset;
     });
     return found == presets_.end() ? nullptr : &*found;
+}
+
+bool EntryPage::CopiesSound(const Wishes& wishes) const {
+    const PresetFacts* preset = CurrentPreset();
+    return wishes.copySound.value_or(preset != nullptr && preset->copiesSound);
 }
 
 } // namespace movieconv::window

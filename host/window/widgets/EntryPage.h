@@ -3,7 +3,6 @@
 #define MOVIECONV_HOST_WINDOW_WIDGETS_ENTRYPAGE_H
 
 #include "host/window/model/Entry.h"
-#include "host/window/model/Worker.h"
 
 #include <QWidget>
 
@@ -11,16 +10,17 @@ class QCheckBox;
 class QComboBox;
 class QFormLayout;
 class QLabel;
-class QLineEdit;
 class QPushButton;
 class QSlider;
-class QToolButton;
 
 namespace movieconv::window {
 
+class BurnChoice;
+class CropChoice;
 class MoreSettings;
-class RangeStrip;
+class RangeChoice;
 class SubtitleFiles;
+class TargetChoice;
 class TrackChoice;
 
 class EntryPage : public QWidget {
@@ -28,7 +28,6 @@ class EntryPage : public QWidget {
 public:
     /// `runner` must outlive it.
     explicit EntryPage(Runner& runner, QWidget* parent = nullptr);
-    ~EntryPage() override;
 
     void Show(const Entry& entry);
     /// The presets there are now.
@@ -45,20 +44,19 @@ Q_SIGNALS:
 private:
     QLayout* MakeHead();
     QFormLayout* MakeForm();
-    QWidget* MakeRange();
-    QWidget* MakeTarget();
+    QLayout* MakePreset();
+    QLayout* MakeQuality();
     QLayout* MakeFoot();
-    void AddTracks(QFormLayout* form);
+    void AddTracks(QFormLayout& form);
     void Connect();
+    void ConnectPictures();
+    void ConnectTracks();
     void FillChoices();
     void ShowWishes();
-    void ShowFindings();
     void ShowTracks();
-    void AskForPictures();
     void Choose(const std::function<void(Wishes&)>& change);
-    void ChooseTimes();
-    void BrowseTarget();
     const PresetFacts* CurrentPreset() const;
+    bool CopiesSound(const Wishes& wishes) const;
 
     Runner& runner_;
     const Abilities abilities_;
@@ -76,21 +74,19 @@ private:
     QComboBox* size_;
     QSlider* quality_;
     QLabel* qualityWords_;
-    RangeStrip* strip_;
-    QLineEdit* begin_;
-    QLineEdit* end_;
+    CropChoice* crop_;
+    QComboBox* deinterlace_;
+    RangeChoice* range_;
+    QComboBox* clip_;
     QLabel* soundsLabel_;
     TrackChoice* sounds_;
+    QCheckBox* copySound_;
     QLabel* subtitlesLabel_;
     TrackChoice* subtitles_;
     SubtitleFiles* subtitleFiles_;
-    QLineEdit* target_;
-    QPushButton* browse_;
-    QLabel* findings_;
-    QLabel* notes_;
-    QCheckBox* replace_;
+    BurnChoice* burning_;
+    TargetChoice* target_;
     MoreSettings* more_;
-    Worker worker_; // last: its tasks refer to the rest
 };
 
 } // namespace movieconv::window

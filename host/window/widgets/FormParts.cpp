@@ -1,6 +1,43 @@
 #include "host/window/widgets/FormParts.h"
 
+#include "host/window/model/Entry.h"
+#include "text/Path.h"
+
+#include <QCoreApplication>
+#include <QFileDialog>
+
 namespace movieconv::window {
+namespace {
+
+struct Texts {
+    Q_DECLARE_TR_FUNCTIONS(FormParts)
+};
+
+} // namespace
+
+QVBoxLayout* MakeColumn(QWidget& owner, int spacing) {
+    auto* column = new QVBoxLayout(&owner);
+    column->setContentsMargins(0, 0, 0, 0);
+    column->setSpacing(spacing);
+    return column;
+}
+
+void AllowNarrow(QComboBox& box) {
+    constexpr int kLetters = 10;
+    box.setSizeAdjustPolicy(QComboBox::AdjustToMinimumContentsLengthWithIcon);
+    box.setMinimumContentsLength(kLetters);
+}
+
+QFileDialog* OpenSubtitles(QWidget& parent, const QString& title, const std::string& movie) {
+    auto* dialog =
+        new QFileDialog(&parent, title, Readable(text::FolderOf(movie)),
+                        Texts::tr("Subtitles") + QStringLiteral(" (*.srt *.ass *.ssa *.vtt *.sub *.txt);;") +
+                            Texts::tr("All files") + QStringLiteral(" (*)"));
+    dialog->setObjectName(QStringLiteral("openSubtitles"));
+    dialog->setAttribute(Qt::WA_DeleteOnClose);
+    dialog->setFileMode(QFileDialog::ExistingFiles);
+    return dialog;
+}
 
 QLabel* MakeRowLabel(const QString& words, QWidget* field) {
     auto* label = new QLabel(words);
@@ -11,6 +48,8 @@ QLabel* MakeRowLabel(const QString& words, QWidget* field) {
 
 void AddRow(QFormLayout& form, const QString& words, QWidget* field, const QString& description) {
     field->setAccessibleName(QString(words).remove(QLatin1Char('&')));
+    if (auto* box = qobject_cast<QComboBox*>(field))
+        AllowNarrow(*box);
     if (!description.isEmpty()) {
         field->setToolTip(description);
         field->setAccessibleDescription(description);

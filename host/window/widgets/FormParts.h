@@ -5,10 +5,14 @@
 #include <QComboBox>
 #include <QFormLayout>
 #include <QLabel>
+#include <QVBoxLayout>
 #include <QVariant>
 
 #include <algorithm>
 #include <optional>
+#include <string>
+
+class QFileDialog;
 
 namespace movieconv::window {
 
@@ -27,6 +31,15 @@ std::optional<T> ValueOf(const QComboBox& box) {
     const QVariant data = box.currentData();
     return data.isValid() ? std::optional(data.value<T>()) : std::nullopt;
 }
+
+/// A layout for `owner` that lies flush with what is around it.
+QVBoxLayout* MakeColumn(QWidget& owner, int spacing);
+
+/// Lets a box become narrower than its longest item.
+void AllowNarrow(QComboBox& box);
+
+/// Asks for files of subtitles, first beside the movie. Not shown yet; deletes itself when it is closed.
+QFileDialog* OpenSubtitles(QWidget& parent, const QString& title, const std::string& movie);
 
 /// A row whose label names the field, with a key where `words` has one, to screen readers too.
 void AddRow(QFormLayout& form, const QString& words, QWidget* field, const QString& description = {});

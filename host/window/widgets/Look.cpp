@@ -17,9 +17,12 @@ QColor Between(const QColor& one, const QColor& other, double share) {
 }
 
 /// Follows the palette, which a style sheet or a set palette would not.
-class Hint : public QLabel {
+class Coloured : public QLabel {
 public:
-    using QLabel::QLabel;
+    explicit Coloured(QColor (*colour)(const QPalette&)) : colour_(colour) {
+        setWordWrap(true);
+        setTextFormat(Qt::PlainText);
+    }
 
 protected:
     void changeEvent(QEvent* event) override {
@@ -35,10 +38,12 @@ protected:
 private:
     void Colour() {
         QPalette changed = QApplication::palette();
-        changed.setColor(QPalette::WindowText, DimColour(changed));
+        changed.setColor(QPalette::WindowText, colour_(changed));
         if (changed != palette())
             setPalette(changed);
     }
+
+    QColor (*const colour_)(const QPalette&);
 };
 
 } // namespace
@@ -121,10 +126,15 @@ void SetTitle(QLabel& title, const QString& name) {
     title.setAccessibleName(name);
 }
 
+QLabel* MakeRemark(QColor (*colour)(const QPalette& palette)) {
+    auto* label = new Coloured(colour);
+    label->setMinimumWidth(1);
+    return label;
+}
+
 QLabel* MakeHint(const QString& text) {
-    auto* label = new Hint(text);
-    label->setWordWrap(true);
-    label->setTextFormat(Qt::PlainText);
+    auto* label = new Coloured(&DimColour);
+    label->setText(text);
     return label;
 }
 

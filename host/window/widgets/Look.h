@@ -28,6 +28,9 @@ QPalette OwnPalette(bool dark);
 QLabel* MakeTitle(const QString& text, double scale, bool strong);
 /// Shows a file's name, which may be longer than any line.
 void SetTitle(QLabel& title, const QString& name);
+/// A label of several lines in a colour that follows the palette; a long path in it is cut and widens
+/// nothing.
+QLabel* MakeRemark(QColor (*colour)(const QPalette& palette));
 /// A label for what is said beside something.
 QLabel* MakeHint(const QString& text = {});
 

@@ -117,7 +117,7 @@ void MainWindow::Connect() {
     });
     connect(entryPage_, &EntryPage::TargetChosen, &queue_, &Queue::SetTarget);
     connect(entryPage_, &EntryPage::ReplaceChosen, &queue_, &Queue::SetReplace);
-    connect(entryPage_, &EntryPage::AllWanted, this, &MainWindow::UseForAll);
+    connect(entryPage_, &EntryPage::AllWanted, &queue_, &Queue::SetWishesOfAll);
     connect(entryPage_, &EntryPage::SavingWanted, this, &MainWindow::SavePreset);
     connect(entryPage_, &EntryPage::LoadingWanted, this, &MainWindow::LoadPreset);
 }
@@ -220,15 +220,6 @@ void MainWindow::LoadPreset(quint64 id) {
         }
     });
     dialog->show();
-}
-
-void MainWindow::UseForAll(const Wishes& wishes) {
-    QList<quint64> ids;
-    for (const Entry& entry : queue_.Entries())
-        if (entry.state == State::kWaiting)
-            ids.append(entry.id);
-    for (const quint64 id : ids)
-        queue_.SetWishes(id, WithOwn(wishes, queue_.Find(id)->wishes));
 }
 
 void MainWindow::StartOrGoOn() {

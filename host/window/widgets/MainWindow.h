@@ -67,7 +67,6 @@ private:
     void ShowNaming();
     void SavePreset(const Wishes& wishes);
     void LoadPreset(quint64 id);
-    void UseForAll(const Wishes& wishes);
     void ShowEntry();
     void ShowTotals();
     void ShowActions();

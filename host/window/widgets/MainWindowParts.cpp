@@ -23,6 +23,8 @@ namespace movieconv::window {
 namespace {
 
 constexpr int kListWidth = 380;
+constexpr int kLeastOfList = 240;
+constexpr int kLeastOfPage = 510; // so that the list gives way first
 
 class BigSign : public QWidget {
 public:
@@ -209,7 +211,8 @@ QWidget* MainWindow::MakeWorkspace() {
     splitter->setSizes({kListWidth, 1080 - kListWidth});
     splitter->setHandleWidth(1);
     splitter->setChildrenCollapsible(false);
-    view_->setMinimumWidth(240);
+    view_->setMinimumWidth(kLeastOfList);
+    details_->setMinimumWidth(kLeastOfPage);
     return splitter;
 }
 

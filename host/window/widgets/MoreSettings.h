@@ -6,14 +6,12 @@
 
 #include <QWidget>
 
-#include <array>
 #include <functional>
 
 class QCheckBox;
 class QComboBox;
 class QFormLayout;
 class QLineEdit;
-class QSpinBox;
 class QToolButton;
 
 namespace movieconv::window {
@@ -21,21 +19,18 @@ namespace movieconv::window {
 class MoreSettings : public QWidget {
     Q_OBJECT
 public:
-    explicit MoreSettings(const Abilities& abilities, QWidget* parent = nullptr);
+    explicit MoreSettings(QWidget* parent = nullptr);
 
-    /// `facts`: null while they are not known.
-    void Show(const Wishes& wishes, const MovieFacts* facts);
+    /// `facts`: null while they are not known. `copiesSound`: it stays as it is.
+    void Show(const Wishes& wishes, const MovieFacts* facts, bool copiesSound);
 
 Q_SIGNALS:
     void Chosen(const movieconv::window::Wishes& wishes);
 
 private:
-    QFormLayout* MakeForm(const Abilities& abilities);
-    QWidget* MakeCrop();
+    QFormLayout* MakeForm();
     void FillChoices();
     void Connect();
-    void ShowCrop(const MovieFacts* facts);
-    void ChooseCrop();
     void Choose(const std::function<void(Wishes&)>& change);
 
     Wishes wishes_;
@@ -44,11 +39,6 @@ private:
     QFormLayout* form_;
     QComboBox* rate_;
     QComboBox* channels_;
-    QComboBox* clip_;
-    QComboBox* deinterlace_;
-    QComboBox* crop_;
-    QWidget* margins_;
-    std::array<QSpinBox*, 4> sides_{}; // above, below, left, right
     QComboBox* hdr_;
     QComboBox* depth_;
     QCheckBox* pictures_;

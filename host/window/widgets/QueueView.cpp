@@ -42,14 +42,7 @@ void QueueView::Select(quint64 id) {
 }
 
 void QueueView::MoveSelected(int by) {
-    QList<quint64> ids = SelectedIds();
-    if (by > 0)
-        std::reverse(ids.begin(), ids.end());
-    const int edge = by > 0 ? queue_.rowCount() - 1 : 0;
-    if (ids.isEmpty() || queue_.RowOf(ids.front()) == edge)
-        return;
-    for (const quint64 id : ids)
-        queue_.Move(id, queue_.RowOf(id) + by);
+    queue_.MoveBy(SelectedIds(), by);
 }
 
 void QueueView::dragEnterEvent(QDragEnterEvent* event) {
@@ -76,11 +69,7 @@ void QueueView::dropEvent(QDropEvent* event) {
     int row = queue_.rowCount();
     if (below.isValid())
         row = below.row() + (place.y() > visualRect(below).center().y() ? 1 : 0);
-    for (const quint64 id : SelectedIds()) {
-        const int from = queue_.RowOf(id);
-        queue_.moveRows({}, from, 1, {}, row);
-        row = queue_.RowOf(id) + 1;
-    }
+    queue_.MoveBefore(SelectedIds(), row);
     event->setDropAction(Qt::CopyAction); // the rows were moved already: the view must not remove any
     event->accept();
 }

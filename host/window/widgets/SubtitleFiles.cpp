@@ -4,7 +4,6 @@
 #include "host/window/model/Languages.h"
 #include "host/window/widgets/FormParts.h"
 #include "host/window/widgets/Icons.h"
-#include "text/Path.h"
 
 #include <QFileDialog>
 #include <QHBoxLayout>
@@ -16,9 +15,7 @@
 namespace movieconv::window {
 
 SubtitleFiles::SubtitleFiles(QWidget* parent)
-    : QWidget(parent), layout_(new QVBoxLayout(this)), add_(new QPushButton(tr("&Add a subtitle file…"))) {
-    layout_->setContentsMargins(0, 0, 0, 0);
-    layout_->setSpacing(6);
+    : QWidget(parent), layout_(MakeColumn(*this, 6)), add_(new QPushButton(tr("&Add a subtitle file…"))) {
     auto* row = new QHBoxLayout;
     row->addWidget(add_);
     row->addStretch();
@@ -36,9 +33,7 @@ void SubtitleFiles::Show(const std::vector<SubtitleFile>& files, const std::stri
         rows_->deleteLater(); // one of its controls may have asked for this
     }
     rows_ = new QWidget;
-    auto* rows = new QVBoxLayout(rows_);
-    rows->setContentsMargins(0, 0, 0, 0);
-    rows->setSpacing(4);
+    MakeColumn(*rows_, 4);
     for (size_t number = 0; number < files_.size(); ++number)
         AddRow(number);
     layout_->insertWidget(0, rows_);
@@ -49,10 +44,11 @@ void SubtitleFiles::AddRow(size_t number) {
     const SubtitleFile& file = files_[number];
     const QString name = NameOf(file.path);
     auto* label =
-        new QLabel(fontMetrics().elidedText(name, Qt::ElideMiddle, fontMetrics().averageCharWidth() * 34));
+        new QLabel(fontMetrics().elidedText(name, Qt::ElideMiddle, fontMetrics().averageCharWidth() * 18));
     label->setTextFormat(Qt::PlainText);
     label->setToolTip(Readable(file.path));
     auto* language = new QComboBox;
+    AllowNarrow(*language);
     language->setAccessibleName(tr("Language of %1").arg(name));
     language->addItem(tr("Language not told"), QString());
     for (const NamedLanguage& offered : OfferedLanguages())
@@ -80,13 +76,7 @@ void SubtitleFiles::AddRow(size_t number) {
 }
 
 void SubtitleFiles::Browse() {
-    auto* dialog =
-        new QFileDialog(this, tr("Add subtitles"), Readable(text::FolderOf(movie_)),
-                        tr("Subtitles") + QStringLiteral(" (*.srt *.ass *.ssa *.vtt *.sub *.txt);;") +
-                            tr("All files") + QStringLiteral(" (*)"));
-    dialog->setObjectName(QStringLiteral("openSubtitles"));
-    dialog->setAttribute(Qt::WA_DeleteOnClose);
-    dialog->setFileMode(QFileDialog::ExistingFiles);
+    QFileDialog* dialog = OpenSubtitles(*this, tr("Add subtitles"), movie_);
     connect(dialog, &QFileDialog::filesSelected, this, [this](const QStringList& paths) {
         Change([&](auto& files) {
             for (const QString& path : paths)

@@ -1,6 +1,7 @@
 #include "host/window/widgets/TrackChoice.h"
 
 #include "host/window/model/Words.h"
+#include "host/window/widgets/FormParts.h"
 
 #include <QCheckBox>
 #include <QHBoxLayout>
@@ -14,10 +15,9 @@ constexpr qsizetype kMany = 4;
 } // namespace
 
 TrackChoice::TrackChoice(const QString& name, QWidget* parent)
-    : QWidget(parent), few_(new QWidget), layout_(new QVBoxLayout(this)) {
+    : QWidget(parent), few_(new QWidget), layout_(MakeColumn(*this, 4)) {
     setAccessibleName(name);
     layout_->setContentsMargins(0, kMargin, 0, 0);
-    layout_->setSpacing(4);
     auto* row = new QHBoxLayout(few_);
     row->setContentsMargins(0, 0, 0, 0);
     for (const bool on : {true, false}) {
@@ -30,7 +30,9 @@ TrackChoice::TrackChoice(const QString& name, QWidget* parent)
     layout_->addWidget(few_);
 }
 
-void TrackChoice::Show(const std::vector<TrackFacts>& tracks, const std::optional<QList<int>>& chosen) {
+void TrackChoice::Show(const std::vector<TrackFacts>& tracks, const std::optional<QList<int>>& chosen,
+                       const std::optional<int>& apart) {
+    apart_ = apart;
     bool same = static_cast<size_t>(checks_.size()) == tracks.size();
     for (qsizetype i = 0; same && i < checks_.size(); ++i)
         same = checks_[i]->text() == TrackLine(tracks[static_cast<size_t>(i)]);
@@ -40,7 +42,7 @@ void TrackChoice::Show(const std::vector<TrackFacts>& tracks, const std::optiona
     for (qsizetype i = 0; i < checks_.size(); ++i) {
         const int number = tracks[static_cast<size_t>(i)].number;
         checks_[i]->setProperty("number", number);
-        checks_[i]->setChecked(!chosen || chosen->contains(number));
+        checks_[i]->setChecked(chosen ? chosen->contains(number) : number != apart);
     }
     filling_ = false;
 }
@@ -69,11 +71,16 @@ void TrackChoice::TickAll(bool on) {
 }
 
 void TrackChoice::Tell() {
-    QList<int> numbers;
-    for (const QCheckBox* check : checks_)
+    QList<int> ticked;
+    QList<int> usual;
+    for (const QCheckBox* check : checks_) {
+        const int number = check->property("number").toInt();
         if (check->isChecked())
-            numbers.append(check->property("number").toInt());
-    Q_EMIT Chosen(numbers.size() == checks_.size() ? std::nullopt : std::optional(numbers));
+            ticked.append(number);
+        if (number != apart_)
+            usual.append(number);
+    }
+    Q_EMIT Chosen(ticked == usual ? std::nullopt : std::optional(ticked));
 }
 
 } // namespace movieconv::window

@@ -20,8 +20,9 @@ public:
     /// `name`: of all of them together, for screen readers.
     explicit TrackChoice(const QString& name, QWidget* parent = nullptr);
 
-    /// `chosen`: their numbers; nothing: all.
-    void Show(const std::vector<TrackFacts>& tracks, const std::optional<QList<int>>& chosen);
+    /// `chosen`: their numbers; nothing: all but `apart`, which is used in another way.
+    void Show(const std::vector<TrackFacts>& tracks, const std::optional<QList<int>>& chosen,
+              const std::optional<int>& apart = std::nullopt);
 
 Q_SIGNALS:
     void Chosen(const std::optional<QList<int>>& numbers);
@@ -34,6 +35,7 @@ private:
     QWidget* few_; // the way to tick all or none
     QVBoxLayout* layout_;
     QList<QCheckBox*> checks_;
+    std::optional<int> apart_;
     bool filling_ = false;
 };
 

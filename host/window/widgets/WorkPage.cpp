@@ -92,26 +92,45 @@ WorkPage::WorkPage(QWidget* parent)
 
 QWidget* WorkPage::MakeFigures() {
     auto* figures = new QWidget;
-    auto* grid = new QGridLayout(figures);
-    grid->setContentsMargins(0, 0, 0, 0);
-    grid->setHorizontalSpacing(28);
-    grid->setVerticalSpacing(2);
-    left_ = MakeFigure(grid, 0, tr("Time left"));
-    speed_ = MakeFigure(grid, 1, tr("Speed"));
-    position_ = MakeFigure(grid, 2, tr("Converted"));
-    bytes_ = MakeFigure(grid, 3, tr("Written"));
-    grid->setColumnStretch(4, 1);
+    figures_ = new QGridLayout(figures);
+    figures_->setContentsMargins(0, 0, 0, 0);
+    figures_->setHorizontalSpacing(28);
+    figures_->setVerticalSpacing(2);
+    left_ = MakeFigure(tr("Time left"));
+    speed_ = MakeFigure(tr("Speed"));
+    position_ = MakeFigure(tr("Converted"));
+    bytes_ = MakeFigure(tr("Written"));
     return figures;
 }
 
-QLabel* WorkPage::MakeFigure(QGridLayout* grid, int column, const QString& name) {
+QLabel* WorkPage::MakeFigure(const QString& name) {
     QLabel* hint = MakeHint(name);
     hint->setWordWrap(false);
-    grid->addWidget(hint, 0, column);
     auto* value = new QLabel;
     value->setAccessibleName(name);
-    grid->addWidget(value, 1, column);
+    figuresIn_.emplaceBack(hint, value);
     return value;
+}
+
+/// All figures in a row, or in two where the page is narrow.
+void WorkPage::Arrange(int columns) {
+    if (columns == columns_)
+        return;
+    figures_->setColumnStretch(columns_, 0);
+    columns_ = columns;
+    for (int i = 0; i < figuresIn_.size(); ++i) {
+        const auto& [hint, value] = figuresIn_[i];
+        const int row = i / columns * 2;
+        figures_->addWidget(hint, row, i % columns);
+        figures_->addWidget(value, row + 1, i % columns);
+    }
+    figures_->setColumnStretch(columns, 1);
+}
+
+void WorkPage::resizeEvent(QResizeEvent* event) {
+    constexpr int kNarrow = 680;
+    Arrange(width() < kNarrow ? 2 : 4);
+    QWidget::resizeEvent(event);
 }
 
 void WorkPage::Show(const Entry& entry) {

@@ -5,7 +5,10 @@
 #include "host/window/model/Entry.h"
 
 #include <QImage>
+#include <QList>
 #include <QWidget>
+
+#include <utility>
 
 class QGridLayout;
 class QLabel;
@@ -44,9 +47,13 @@ Q_SIGNALS:
     void PauseWanted(quint64 id, bool pause);
     void StopWanted(quint64 id);
 
+protected:
+    void resizeEvent(QResizeEvent* event) override;
+
 private:
     QWidget* MakeFigures();
-    QLabel* MakeFigure(QGridLayout* grid, int column, const QString& name);
+    QLabel* MakeFigure(const QString& name);
+    void Arrange(int columns);
 
     quint64 shown_ = 0;
     bool paused_ = false;
@@ -55,6 +62,9 @@ private:
     QLabel* phase_;
     QLabel* percent_;
     QProgressBar* bar_;
+    QGridLayout* figures_; // names above values
+    QList<std::pair<QLabel*, QLabel*>> figuresIn_;
+    int columns_ = 0;
     QLabel* speed_;
     QLabel* left_;
     QLabel* position_;
