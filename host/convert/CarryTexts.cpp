@@ -13,7 +13,6 @@
 #include <cstddef>
 #include <fmt/format.h>
 #include <string>
-#include <string_view>
 #include <utility>
 
 namespace movieconv {

@@ -35,6 +35,10 @@ constexpr const char* kSentences[] = {
     QT_TRANSLATE_NOOP("Library", "only one cover is carried"),
     QT_TRANSLATE_NOOP("Library", "it is neither JPEG nor PNG"),
     QT_TRANSLATE_NOOP("Library", "it has no name or no content"),
+    QT_TRANSLATE_NOOP("Library", "it belongs to the pictures"),
+    QT_TRANSLATE_NOOP("Library", "“%1” makes no sense"),
+    QT_TRANSLATE_NOOP("Library", "one of their texts could not be converted"),
+    QT_TRANSLATE_NOOP("Library", "%1 of their texts could not be converted"),
     // Why a conversion is refused.
     QT_TRANSLATE_NOOP("Library", "%1 cannot hold “%2” sound as it is; no format can"),
     QT_TRANSLATE_NOOP("Library", "%1 cannot hold “%2” sound as it is; %3 can"),
@@ -85,7 +89,8 @@ constexpr const char* kWords[] = {
     QT_TRANSLATE_NOOP("Library", "cover"),     QT_TRANSLATE_NOOP("Library", "attachment"),
     QT_TRANSLATE_NOOP("Library", "data"),      QT_TRANSLATE_NOOP("Library", "tags"),
     QT_TRANSLATE_NOOP("Library", "label"),     QT_TRANSLATE_NOOP("Library", "language"),
-    QT_TRANSLATE_NOOP("Library", "title"),     QT_TRANSLATE_NOOP("Library", "flags")};
+    QT_TRANSLATE_NOOP("Library", "title"),     QT_TRANSLATE_NOOP("Library", "flags"),
+    QT_TRANSLATE_NOOP("Library", "timecode")};
 
 using Sentence = std::pair<QRegularExpression, const char*>;
 

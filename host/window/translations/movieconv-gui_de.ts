@@ -553,6 +553,26 @@
         <comment>the last two of a list</comment>
         <translation>%1 und %2</translation>
     </message>
+    <message>
+        <source>it belongs to the pictures</source>
+        <translation>er gehört zu den Bildern</translation>
+    </message>
+    <message>
+        <source>“%1” makes no sense</source>
+        <translation>„%1“ ergibt keinen Sinn</translation>
+    </message>
+    <message>
+        <source>one of their texts could not be converted</source>
+        <translation>einer ihrer Texte konnte nicht umgewandelt werden</translation>
+    </message>
+    <message>
+        <source>%1 of their texts could not be converted</source>
+        <translation>%1 ihrer Texte konnten nicht umgewandelt werden</translation>
+    </message>
+    <message>
+        <source>timecode</source>
+        <translation>Zeitcode</translation>
+    </message>
 </context>
 <context>
     <name>LogShare</name>
@@ -1432,7 +1452,7 @@
     </message>
     <message>
         <source>Keep title, date and other texts</source>
-        <translation>Titel, Datum und andere Te&amp;xte behalten</translation>
+        <translation>Titel und andere Te&amp;xte behalten</translation>
     </message>
     <message>
         <source>The sound stays as it is, and so do its channels.</source>
