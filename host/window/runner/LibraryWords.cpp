@@ -39,6 +39,7 @@ constexpr const char* kSentences[] = {
     QT_TRANSLATE_NOOP("Library", "“%1” makes no sense"),
     QT_TRANSLATE_NOOP("Library", "one of their texts could not be converted"),
     QT_TRANSLATE_NOOP("Library", "%1 of their texts could not be converted"),
+    QT_TRANSLATE_NOOP("Library", "%1 of them are in other editions or within others"),
     // Why a conversion is refused.
     QT_TRANSLATE_NOOP("Library", "%1 cannot hold “%2” sound as it is; no format can"),
     QT_TRANSLATE_NOOP("Library", "%1 cannot hold “%2” sound as it is; %3 can"),

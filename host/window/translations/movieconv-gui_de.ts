@@ -570,6 +570,10 @@
         <translation>%1 ihrer Texte konnten nicht umgewandelt werden</translation>
     </message>
     <message>
+        <source>%1 of them are in other editions or within others</source>
+        <translation>%1 davon gehören zu anderen Fassungen oder stehen innerhalb anderer</translation>
+    </message>
+    <message>
         <source>timecode</source>
         <translation>Zeitcode</translation>
     </message>
