@@ -21,7 +21,7 @@
 namespace movieconv::window {
 namespace {
 
-struct Texts {
+struct ForesightTexts {
     Q_DECLARE_TR_FUNCTIONS(Foresight)
 };
 
@@ -31,11 +31,11 @@ void WarnOfTarget(Findings& findings, const Order& order) {
     findings.targetExists = fs::exists(fs::symlink_status(order.target, unknown));
     if (findings.targetExists && fs::equivalent(order.source, order.target, unknown))
         findings.warnings +=
-            Texts::tr("The new file cannot take the place of its source. Choose another name.");
+            ForesightTexts::tr("The new file cannot take the place of its source. Choose another name.");
     else if (findings.targetExists && !order.replace)
-        findings.warnings += Texts::tr("There is a file of this name already.");
+        findings.warnings += ForesightTexts::tr("There is a file of this name already.");
     else if (findings.targetExists)
-        findings.warnings += Texts::tr("The file that exists will be replaced.");
+        findings.warnings += ForesightTexts::tr("The file that exists will be replaced.");
 }
 
 void WarnOfFiles(Findings& findings, const Wishes& wishes) {
@@ -47,15 +47,15 @@ void WarnOfFiles(Findings& findings, const Wishes& wishes) {
     std::error_code unknown;
     for (const std::string& path : files)
         if (!std::filesystem::is_regular_file(path, unknown))
-            findings.warnings += Texts::tr("The subtitles “%1” were not found.").arg(Readable(path));
+            findings.warnings += ForesightTexts::tr("The subtitles “%1” were not found.").arg(Readable(path));
 }
 
 /// Wishes that others make void.
 void TellWhatHasNoEffect(Findings& findings, const Wishes& wishes, const Request& request) {
     if (request.copySound && !request.noAudio && wishes.channels)
-        findings.notes += Texts::tr("The sound stays as it is, and so do its channels.");
+        findings.notes += ForesightTexts::tr("The sound stays as it is, and so do its channels.");
     if (request.noVideo && wishes.burning.IsWanted())
-        findings.notes += Texts::tr("Without pictures, no subtitles are drawn.");
+        findings.notes += ForesightTexts::tr("Without pictures, no subtitles are drawn.");
 }
 
 /// What the library is going to refuse, and what it is going to leave behind.
@@ -71,8 +71,8 @@ void WarnOfContent(Findings& findings, const Order& order, const Request& reques
         for (const NotCarried& what : ForetellLeftBehind(source, request, format))
             left += LineOf(what);
         if (!left.isEmpty())
-            findings.notes +=
-                Texts::tr("Not carried over:") + QStringLiteral("\n• ") + left.join(QStringLiteral("\n• "));
+            findings.notes += ForesightTexts::tr("Not carried over:") + QStringLiteral("\n• ") +
+                              left.join(QStringLiteral("\n• "));
     } catch (const Failure& failure) {
         findings.warnings += SentenceOf(failure.Text());
     }
@@ -86,7 +86,7 @@ void WarnOfRoom(Findings& findings, const Order& order, const Request& request, 
         return;
     findings.free = free;
     if (free < *findings.needed) {
-        findings.warnings += Texts::tr("About %1 are needed, but only %2 are free in “%3”.")
+        findings.warnings += ForesightTexts::tr("About %1 are needed, but only %2 are free in “%3”.")
                                  .arg(BytesText(*findings.needed), BytesText(free), Readable(folder));
     }
 }
@@ -99,7 +99,7 @@ Findings Foresee(const Order& order) {
     const std::string folder = text::FolderOf(order.target);
     WarnOfTarget(findings, order);
     if (!std::filesystem::is_directory(folder, unknown)) {
-        findings.warnings += Texts::tr("There is no folder “%1”.").arg(Readable(folder));
+        findings.warnings += ForesightTexts::tr("There is no folder “%1”.").arg(Readable(folder));
         return findings;
     }
     try {

@@ -21,31 +21,37 @@
 namespace movieconv::window {
 namespace {
 
-struct Words {
+struct PresetWords {
     const char* name;
     const char* title;
     const char* description;
 };
 
-constexpr std::array kWords = {
-    Words{"standard", QT_TRANSLATE_NOOP("Presets", "Standard"),
-          QT_TRANSLATE_NOOP("Presets", "Looks like the source and plays on nearly everything (H.264, AAC).")},
-    Words{"small", QT_TRANSLATE_NOOP("Presets", "Small"),
-          QT_TRANSLATE_NOOP("Presets", "Half the size at nearly the same quality, and slower (HEVC, AAC).")},
-    Words{"best", QT_TRANSLATE_NOOP("Presets", "Best"),
-          QT_TRANSLATE_NOOP("Presets", "No difference to be seen, in large files (H.264, AAC).")},
-    Words{"web", QT_TRANSLATE_NOOP("Presets", "Web"),
-          QT_TRANSLATE_NOOP("Presets", "For web pages, in formats that are free of patents (VP9, Opus).")},
-    Words{"av1", QT_TRANSLATE_NOOP("Presets", "AV1"),
-          QT_TRANSLATE_NOOP("Presets", "The smallest files, for new players (AV1, Opus).")},
-    Words{"phone", QT_TRANSLATE_NOOP("Presets", "Phone"),
-          QT_TRANSLATE_NOOP("Presets", "Small pictures for small screens (H.264 up to 720 lines, AAC).")},
-    Words{"archive", QT_TRANSLATE_NOOP("Presets", "Archive"),
-          QT_TRANSLATE_NOOP("Presets", "Without any loss, in very large files (FFV1, FLAC).")},
-    Words{"sound", QT_TRANSLATE_NOOP("Presets", "Sound alone"),
-          QT_TRANSLATE_NOOP("Presets", "Leaves the pictures out (AAC).")},
-    Words{"classic", QT_TRANSLATE_NOOP("Presets", "Classic"),
-          QT_TRANSLATE_NOOP("Presets", "As the program converted in its first version (MPEG-4, AAC).")}};
+constexpr std::array kPresetWords = {
+    PresetWords{
+        "standard", QT_TRANSLATE_NOOP("Presets", "Standard"),
+        QT_TRANSLATE_NOOP("Presets", "Looks like the source and plays on nearly everything (H.264, AAC).")},
+    PresetWords{
+        "small", QT_TRANSLATE_NOOP("Presets", "Small"),
+        QT_TRANSLATE_NOOP("Presets", "Half the size at nearly the same quality, and slower (HEVC, AAC).")},
+    PresetWords{"best", QT_TRANSLATE_NOOP("Presets", "Best"),
+                QT_TRANSLATE_NOOP("Presets", "No difference to be seen, in large files (H.264, AAC).")},
+    PresetWords{
+        "web", QT_TRANSLATE_NOOP("Presets", "Web"),
+        QT_TRANSLATE_NOOP("Presets", "For web pages, in formats that are free of patents (VP9, Opus).")},
+    PresetWords{"av1", QT_TRANSLATE_NOOP("Presets", "AV1"),
+                QT_TRANSLATE_NOOP("Presets", "The smallest files, for new players (AV1, Opus).")},
+    PresetWords{
+        "phone", QT_TRANSLATE_NOOP("Presets", "Phone"),
+        QT_TRANSLATE_NOOP("Presets", "Small pictures for small screens (H.264 up to 720 lines, AAC).")},
+    PresetWords{"archive", QT_TRANSLATE_NOOP("Presets", "Archive"),
+                QT_TRANSLATE_NOOP(
+                    "Presets", "Lossless, but for colours finer than 4:2:0; very large files (FFV1, FLAC).")},
+    PresetWords{"sound", QT_TRANSLATE_NOOP("Presets", "Sound alone"),
+                QT_TRANSLATE_NOOP("Presets", "Leaves the pictures out (AAC).")},
+    PresetWords{
+        "classic", QT_TRANSLATE_NOOP("Presets", "Classic"),
+        QT_TRANSLATE_NOOP("Presets", "As the program converted in its first version (MPEG-4, AAC).")}};
 
 constexpr int kUsualHeight = 1080; // for which a preset's place on the window's scale is reckoned
 
@@ -193,10 +199,11 @@ std::vector<PresetFacts> PresetsOnShelf() {
     for (const PresetSummary& summary : ListPresets()) {
         try {
             PresetFacts facts = FactsOf(movieconv::LoadPreset(summary.name));
-            const auto words = std::find_if(kWords.begin(), kWords.end(), [&](const Words& one) {
-                return summary.path.empty() && summary.name == one.name;
-            });
-            if (words != kWords.end()) {
+            const auto words =
+                std::find_if(kPresetWords.begin(), kPresetWords.end(), [&](const PresetWords& one) {
+                    return summary.path.empty() && summary.name == one.name;
+                });
+            if (words != kPresetWords.end()) {
                 facts.title = QCoreApplication::translate("Presets", words->title);
                 facts.description = QCoreApplication::translate("Presets", words->description);
             }

@@ -648,8 +648,8 @@
         <translation>Archiv</translation>
     </message>
     <message>
-        <source>Without any loss, in very large files (FFV1, FLAC).</source>
-        <translation>Ohne jeden Verlust, in sehr großen Dateien (FFV1, FLAC).</translation>
+        <source>Lossless, but for colours finer than 4:2:0; very large files (FFV1, FLAC).</source>
+        <translation>Verlustfrei, außer bei Farben, die feiner sind als 4:2:0; sehr große Dateien (FFV1, FLAC).</translation>
     </message>
     <message>
         <source>Classic</source>
