@@ -146,7 +146,7 @@ const Odd kOddities[] = {
     {"long-sound.mkv", Lossless(1, 3), "o.mp4", 25, 3},
     {"still.mkv", kStill, "o.flv", 100, 14},
     {"variable.mp4", kVariable, "o.avi", 100, 0},
-    {"fast.mkv", kFast, "o.mp4", 30, 0}, // a rate that the engine brings down to 30
+    {"fast.mkv", kFast, "o.mp4", 240, 0}, // a rate that the engine would bring down to 30
     {"milliseconds.avi", kMilliseconds, "o.avi", 25, 0},
     {"plain.mkv", Lossless(2, 2), "o.mkv", 50, 0, {"--no-audio"}},
     {"plain.mkv", Lossless(2, 2), "o.mp3", 0, 2, {"--no-video"}},
