@@ -1,6 +1,7 @@
 #include "writer/Encoder.h"
 
 #include "media/CodeText.h"
+#include "writer/UsualSchedule.h"
 #include "writer/WriterFailure.h"
 #include "writer/WriterStatus.h"
 
@@ -23,7 +24,10 @@ av::CodecContext NewEncoder(const AVCodec* codec, uint32_t code, EncoderFlags fl
 }
 
 void OpenEncoder(AVCodecContext& context, uint32_t code, const std::string& parameters) {
-    const int error = avcodec_open2(&context, context.codec, nullptr);
+    const int error = [&] {
+        const UsualSchedule usual;
+        return avcodec_open2(&context, context.codec, nullptr);
+    }();
     av::CheckMemory(error);
     if (error < 0)
         throw WriterFailure(kWriterErrorCodec, "The encoder for \"" + CodeText(code) + "\" does not accept " +

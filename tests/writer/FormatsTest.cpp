@@ -2,11 +2,15 @@
 #include "MovieReader.h"
 #include "media/CodeText.h"
 #include "tests/support/Folder.h"
+#include "writer/Encoder.h"
 #include "writer/FormatTable.h"
 
 #include <gtest/gtest.h>
 
+#include <filesystem>
+#include <sched.h>
 #include <string>
+#include <unistd.h>
 #include <vector>
 
 namespace {
@@ -172,5 +176,32 @@ TEST(Speed, IsTheEncodersChoiceOfTools) {
 
 INSTANTIATE_TEST_SUITE_P(All, Formats, testing::ValuesIn(AllPairs()), Name);
 INSTANTIATE_TEST_SUITE_P(All, PictureFormats, testing::ValuesIn(PicturePairs()), Name);
+
+TEST(Encoders, LeaveThreadsToTheUsualSchedule) {
+    if (geteuid() != 0)
+        GTEST_SKIP() << "only root may have real-time threads";
+    const av::CodecContext context =
+        writer::NewEncoder(avcodec_find_encoder_by_name("libsvtav1"), FourCC("AV01"), {});
+    context->width = 64;
+    context->height = 64;
+    context->pix_fmt = AV_PIX_FMT_YUV420P;
+    context->time_base = {1, 25};
+    writer::OpenEncoder(*context, FourCC("AV01"), "these pictures");
+    int threads = 0;
+    for (const auto& thread : std::filesystem::directory_iterator("/proc/self/task")) {
+        EXPECT_EQ(sched_getscheduler(std::stoi(thread.path().filename())), SCHED_OTHER) << thread.path();
+        ++threads;
+    }
+    EXPECT_GT(threads, 1);
+    // It is never closed by who has sent it no picture.
+    const av::Frame picture(av_frame_alloc());
+    picture->format = context->pix_fmt;
+    picture->width = context->width;
+    picture->height = context->height;
+    ASSERT_EQ(av_frame_get_buffer(picture.get(), 0), 0);
+    const av::Packet packet = av::NewPacket();
+    writer::Encode(*context, picture.get(), *packet, [](AVPacket&) {});
+    writer::Encode(*context, nullptr, *packet, [](AVPacket&) {});
+}
 
 } // namespace
