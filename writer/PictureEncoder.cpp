@@ -1,10 +1,12 @@
 #include "writer/PictureEncoder.h"
 
 extern "C" {
+#include <libavutil/imgutils.h>
 #include <libavutil/opt.h>
 }
 
 #include <algorithm>
+#include <array>
 #include <cmath>
 #include <new>
 #include <string>
@@ -70,6 +72,24 @@ void SetQuality(AVCodecContext& context, const QualityScale& scale, double quali
     }
 }
 
+/// SVT-AV1 is never closed unless it has had a picture: it waits for what it would make of it.
+void EndWithABlackPicture(AVCodecContext& context, AVPacket& packet) noexcept {
+    try {
+        const av::Frame picture = av::NewFrame();
+        picture->format = context.pix_fmt;
+        picture->width = context.width;
+        picture->height = context.height;
+        av::CheckMemory(av_frame_get_buffer(picture.get(), 0));
+        std::array<ptrdiff_t, 4> pitches{};
+        std::copy_n(picture->linesize, pitches.size(), pitches.begin());
+        av_image_fill_black(picture->data, pitches.data(), context.pix_fmt, context.color_range,
+                            context.width, context.height);
+        writer::Encode(context, picture.get(), packet, [](AVPacket&) {});
+        writer::Encode(context, nullptr, packet, [](AVPacket&) {});
+    } catch (...) { // nothing is lost by it
+    }
+}
+
 } // namespace
 
 PictureEncoder::PictureEncoder(const PictureCodec& codec, const PictureSettings& settings, EncoderFlags flags,
@@ -115,6 +135,11 @@ PictureEncoder::PictureEncoder(const PictureCodec& codec, const PictureSettings&
                     std::to_string(settings.bitrate) + " bits a second");
 }
 
+PictureEncoder::~PictureEncoder() {
+    if (!hasBegun_ && context_->codec_id == AV_CODEC_ID_AV1)
+        EndWithABlackPicture(*context_, *packet_);
+}
+
 void PictureEncoder::Encode(AVFrame& frame, int64_t tick, const PacketTaker& take) {
     if (HasAll())
         return;
@@ -143,7 +168,7 @@ void PictureEncoder::CutHere(const PacketTaker& take) {
 
 void PictureEncoder::Finish(const PacketTaker& take) {
     SendHeld(take);
-    if (!HasAll())
+    if (hasBegun_ && !HasAll())
         Send(nullptr, take);
 }
 
@@ -158,6 +183,7 @@ void PictureEncoder::SendHeld(const PacketTaker& take) {
 }
 
 void PictureEncoder::Send(AVFrame* frame, const PacketTaker& take) {
+    hasBegun_ = true;
     writer::Encode(*context_, frame, *packet_, [&](AVPacket& packet) {
         const int64_t decodingIndex = packet.dts;
         if (cut_ && packet.pts >= *cut_)

@@ -41,6 +41,9 @@ public:
     /// `isCut`: CutHere may be called.
     PictureEncoder(const PictureCodec& codec, const PictureSettings& settings, EncoderFlags flags,
                    int ticksPerPicture, bool isCut);
+    ~PictureEncoder();
+    PictureEncoder(const PictureEncoder&) = delete;
+    PictureEncoder& operator=(const PictureEncoder&) = delete;
 
     /// Encodes a picture that is shown from `tick` on; ticks rise. Throws WriterFailure (kWriterErrorEncode).
     void Encode(AVFrame& frame, int64_t tick, const PacketTaker& take);
@@ -66,6 +69,7 @@ private:
     std::deque<int64_t> ticks_; ///< Ticks of pictures that packets may still name, from firstIndex_ on.
     int64_t firstIndex_ = 0;
     int64_t nextIndex_ = 0;
+    bool hasBegun_ = false;      ///< A picture has reached the encoder.
     int64_t handedOut_ = 0;      ///< Packets.
     bool holds_;                 ///< The last picture is held back, since it may be the one before the cut.
     av::Frame held_;             ///< That one.

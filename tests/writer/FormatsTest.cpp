@@ -204,4 +204,18 @@ TEST(Encoders, LeaveThreadsToTheUsualSchedule) {
     writer::Encode(*context, nullptr, *packet, [](AVPacket&) {});
 }
 
+TEST(Encoders, EndWithoutAPicture) {
+    for (const uint32_t code : {FourCC("AV01"), FourCC("HEVC"), FourCC("H264"), FourCC("VP90")}) {
+        SCOPED_TRACE(CodeText(code));
+        TestMovie movie;
+        movie.pictures = 0;
+        movie.soundSeconds = 0.5;
+        movie.param.fccFileFormat = FourCC("MKV ");
+        movie.param.fccVideo = code;
+        const ReadMovie read = WriteAndRead(movie);
+        EXPECT_TRUE(read.pictures.empty());
+        EXPECT_GT(read.samples, 0);
+    }
+}
+
 } // namespace
