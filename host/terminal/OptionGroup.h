@@ -26,8 +26,8 @@ public:
     }
 
     /// A flag that does more than to set something true.
-    void Action(const std::string& names, std::function<void()> act, const std::string& help) {
-        app_.add_flag_callback(names, std::move(act), help)->group(heading_);
+    void Action(const std::string& names, const std::function<void()>& act, const std::string& help) {
+        app_.add_flag_callback(names, act, help)->group(heading_);
     }
 
     /// A value that is read as its type says.
@@ -38,9 +38,9 @@ public:
 
     /// Likewise, handed to `take`.
     template <class Type>
-    void Taken(const std::string& names, const std::string& type, std::function<void(const Type&)> take,
-               const std::string& help) {
-        app_.add_option_function<Type>(names, std::move(take), help)->type_name(type)->group(heading_);
+    void Taken(const std::string& names, const std::string& type,
+               const std::function<void(const Type&)>& take, const std::string& help) {
+        app_.add_option_function<Type>(names, take, help)->type_name(type)->group(heading_);
     }
 
     /// A whole number from `least` to `most`.
