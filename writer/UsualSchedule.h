@@ -21,7 +21,7 @@ public:
 private:
     const int policy_;
     sched_param parameters_{};
-    const std::set<pid_t> before_; // the process's threads
+    std::set<pid_t> before_; // the process's threads
 };
 
 } // namespace writer
