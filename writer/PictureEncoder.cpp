@@ -136,7 +136,7 @@ PictureEncoder::PictureEncoder(const PictureCodec& codec, const PictureSettings&
 }
 
 PictureEncoder::~PictureEncoder() {
-    if (!hasBegun_ && context_->codec_id == AV_CODEC_ID_AV1)
+    if (!HasBegun() && context_->codec_id == AV_CODEC_ID_AV1)
         EndWithABlackPicture(*context_, *packet_);
 }
 
@@ -168,8 +168,13 @@ void PictureEncoder::CutHere(const PacketTaker& take) {
 
 void PictureEncoder::Finish(const PacketTaker& take) {
     SendHeld(take);
-    if (hasBegun_ && !HasAll())
+    if (HasBegun() && !HasAll())
         Send(nullptr, take);
+}
+
+/// Whether a picture has reached the encoder.
+bool PictureEncoder::HasBegun() const {
+    return nextIndex_ > (held_ ? 1 : 0);
 }
 
 bool PictureEncoder::HasAll() const {
@@ -183,7 +188,6 @@ void PictureEncoder::SendHeld(const PacketTaker& take) {
 }
 
 void PictureEncoder::Send(AVFrame* frame, const PacketTaker& take) {
-    hasBegun_ = true;
     writer::Encode(*context_, frame, *packet_, [&](AVPacket& packet) {
         const int64_t decodingIndex = packet.dts;
         if (cut_ && packet.pts >= *cut_)

@@ -58,6 +58,7 @@ public:
     const AVCodecContext& Context() const { return *context_; }
 
 private:
+    bool HasBegun() const;
     bool HasAll() const;
     void SendHeld(const PacketTaker& take);
     void Send(AVFrame* frame, const PacketTaker& take);
@@ -69,7 +70,6 @@ private:
     std::deque<int64_t> ticks_; ///< Ticks of pictures that packets may still name, from firstIndex_ on.
     int64_t firstIndex_ = 0;
     int64_t nextIndex_ = 0;
-    bool hasBegun_ = false;      ///< A picture has reached the encoder.
     int64_t handedOut_ = 0;      ///< Packets.
     bool holds_;                 ///< The last picture is held back, since it may be the one before the cut.
     av::Frame held_;             ///< That one.

@@ -193,7 +193,7 @@ TEST(Encoders, LeaveThreadsToTheUsualSchedule) {
         ++threads;
     }
     EXPECT_GT(threads, 1);
-    // It is never closed by who has sent it no picture.
+    // This encoder cannot be closed without having had a picture.
     const av::Frame picture(av_frame_alloc());
     picture->format = context->pix_fmt;
     picture->width = context->width;
