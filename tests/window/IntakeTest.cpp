@@ -48,12 +48,12 @@ TEST(Naming, FollowsThePattern) {
         std::string folder;
         std::string expected;
     };
-    const std::string date = QDate::currentDate().toString(Qt::ISODate).toStdString();
+    const QDate today(2026, 3, 9);
     const std::vector<Case> cases = {
         {"/m/a.b.avi", "{name}", "", "/m/a.b.mp4"},
         {"/m/.hidden", "{name}", "/out", "/out/.hidden.mp4"},
         {"/x.mkv", "{name}", "", "/x.mp4"},
-        {"/m/{date}.mkv", "{name} {preset} {height} {date}", "", "/m/{date} standard 720p " + date + ".mp4"},
+        {"/m/{date}.mkv", "{name} {preset} {height} {date}", "", "/m/{date} standard 720p 2026-03-09.mp4"},
         {"/m/a.mkv", "../{name}/x", "", "/m/..-a-x.mp4"},
         {"/m/a.mkv", "  ", "", "/m/a.mp4"},
         {"/m/\xFF\xFE.mkv", "{name}", "", "/m/\xFF\xFE.mp4"},
@@ -65,9 +65,9 @@ TEST(Naming, FollowsThePattern) {
         entry.source = c.source;
         entry.wishes.height = 720;
         const Naming naming{c.pattern, c.folder};
-        EXPECT_EQ(
-            TargetFor(entry, naming, "mp4", [&](const std::string& path) { return taken.contains(path); }),
-            c.expected);
+        EXPECT_EQ(TargetFor(entry, naming, "mp4", today,
+                            [&](const std::string& path) { return taken.contains(path); }),
+                  c.expected);
     }
 }
 
@@ -77,7 +77,7 @@ TEST(Naming, CutsLongNamesBetweenCharacters) {
     for (int i = 0; i < 125; ++i)
         entry.source += "ä";
     entry.source += ".mkv";
-    const std::string path = TargetFor(entry, {}, "mp4", [](const std::string&) { return false; });
+    const std::string path = TargetFor(entry, {}, "mp4", {}, [](const std::string&) { return false; });
     const std::string name = path.substr(3);
     EXPECT_LE(name.size(), 240U);
     EXPECT_GT(name.size(), 230U);

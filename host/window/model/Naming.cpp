@@ -3,8 +3,6 @@
 #include "text/Path.h"
 #include "text/Utf8.h"
 
-#include <QDate>
-
 #include <algorithm>
 
 namespace movieconv::window {
@@ -23,12 +21,12 @@ void ReplaceAll(std::string& text, const std::string& mark, const std::string& v
         text.replace(at, mark.size(), value);
 }
 
-std::string Fill(const Entry& entry, const QString& pattern) {
+std::string Fill(const Entry& entry, const QString& pattern, const QDate& today) {
     std::string name = pattern.toStdString();
     const int height = entry.wishes.height.value_or(entry.facts ? entry.facts->height : 0);
     ReplaceAll(name, "{preset}", entry.wishes.preset.toStdString());
     ReplaceAll(name, "{height}", height > 0 ? std::to_string(height) + "p" : std::string());
-    ReplaceAll(name, "{date}", QDate::currentDate().toString(Qt::ISODate).toStdString());
+    ReplaceAll(name, "{date}", today.toString(Qt::ISODate).toStdString());
     ReplaceAll(name, "{name}", Stem(entry.source)); // last: a source's name may hold marks
     std::replace(name.begin(), name.end(), '/', '-');
     const bool useless = name.find_first_not_of(" .") == std::string::npos;
@@ -37,10 +35,10 @@ std::string Fill(const Entry& entry, const QString& pattern) {
 
 } // namespace
 
-std::string TargetFor(const Entry& entry, const Naming& naming, const QString& extension,
+std::string TargetFor(const Entry& entry, const Naming& naming, const QString& extension, const QDate& today,
                       const IsTaken& isTaken) {
     const std::string folder = naming.folder.empty() ? text::FolderOf(entry.source) : naming.folder;
-    const std::string stem = Fill(entry, naming.pattern);
+    const std::string stem = Fill(entry, naming.pattern, today);
     std::string path;
     int number = 1;
     do {

@@ -4,6 +4,8 @@
 
 #include "host/window/model/Entry.h"
 
+#include <QDate>
+
 #include <functional>
 #include <string>
 
@@ -20,9 +22,9 @@ struct Naming {
 /// Whether a name is used already.
 using IsTaken = std::function<bool(const std::string& path)>;
 
-/// The path for an entry's file, with " (2)" and so on where the name is taken. Never longer than a file
-/// system takes.
-std::string TargetFor(const Entry& entry, const Naming& naming, const QString& extension,
+/// The path for an entry's file, with the date `today` and with " (2)" and so on where the name is taken.
+/// Never longer than a file system takes.
+std::string TargetFor(const Entry& entry, const Naming& naming, const QString& extension, const QDate& today,
                       const IsTaken& isTaken);
 
 } // namespace movieconv::window

@@ -310,13 +310,14 @@ void Queue::ExamineAmong(const std::shared_ptr<const Targets>& targets, quint64 
     const Entry* entry = Find(id);
     if (entry == nullptr)
         return;
-    worker_.Do(id, [this, targets, seen = *entry, naming = naming_, extension = ExtensionFor(entry->wishes)] {
+    worker_.Do(id, [this, targets, seen = *entry, naming = naming_, extension = ExtensionFor(entry->wishes),
+                    today = QDate::currentDate()] {
         Entry found = seen;
         try {
             if (!found.facts)
                 found.facts = runner_.Look(found.source);
             if (!found.targetNamed && found.state == State::kWaiting) {
-                found.target = TargetFor(found, naming, extension, [&](const std::string& path) {
+                found.target = TargetFor(found, naming, extension, today, [&](const std::string& path) {
                     const size_t own = path == seen.target ? 1 : 0;
                     return targets->count(path) > own || Exists(path);
                 });
@@ -354,9 +355,9 @@ void Queue::TakeFound(const Entry& seen, const Entry& found) {
 
 /// By the rules, and apart from the other entries' targets; whether there is such a file is found out later.
 void Queue::AssignTarget(Entry& entry) {
-    entry.target = TargetFor(entry, naming_, ExtensionFor(entry.wishes), [&](const std::string& path) {
-        return path == entry.source || IsTakenByOther(entry, path);
-    });
+    entry.target = TargetFor(
+        entry, naming_, ExtensionFor(entry.wishes), QDate::currentDate(),
+        [&](const std::string& path) { return path == entry.source || IsTakenByOther(entry, path); });
 }
 
 bool Queue::IsTakenByOther(const Entry& entry, const std::string& path) const {

@@ -68,9 +68,10 @@ void NamingDialog::ShowExample() {
     Entry entry;
     entry.source = tr("/Holidays/beach.mov").toStdString();
     entry.wishes.height = 1080;
-    example_->setText(tr("For example: %1")
-                          .arg(Readable(TargetFor(entry, Current(), QStringLiteral("mp4"),
-                                                  [](const std::string&) { return false; }))));
+    example_->setText(
+        tr("For example: %1")
+            .arg(Readable(TargetFor(entry, Current(), QStringLiteral("mp4"), QDate::currentDate(),
+                                    [](const std::string&) { return false; }))));
 }
 
 void NamingDialog::Browse() {
