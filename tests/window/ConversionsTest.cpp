@@ -85,6 +85,18 @@ TEST_F(ConversionsTest, TellsWhatGoesWrongInWords) {
     ASSERT_TRUE(AwaitDone());
     EXPECT_EQ(At(0).state, State::kFailed);
     EXPECT_GT(std::filesystem::file_size(movie), 10'000U);
+
+    std::filesystem::copy_file(movie, folder / "on a stick.mkv");
+    queue.Add({folder / "on a stick.mkv"});
+    AwaitExamined(2);
+    std::filesystem::remove(folder / "on a stick.mkv");
+    dispatcher.Start();
+    ASSERT_TRUE(AwaitDone());
+    EXPECT_TRUE(At(1).outcome.sentence.contains(QStringLiteral("connected")))
+        << At(1).outcome.sentence.toStdString();
+    queue.Retry({At(1).id});
+    AwaitExamined(2);
+    EXPECT_TRUE(At(1).unusable.contains(QStringLiteral("connected")));
 }
 
 TEST_F(ConversionsTest, CarriesTheTracksThatAreChosen) {
@@ -162,6 +174,7 @@ TEST_F(ConversionsTest, CarriesTheTracksThatAreChosen) {
     EXPECT_EQ(made.title, "Mine");
 
     queue.Retry({At(0).id});
+    AwaitExamined(1);
     wishes.copySound = true;
     wishes.channels = 1;
     wishes.subtitles.reset();

@@ -108,6 +108,19 @@ TEST_F(DispatcherTest, PausesResumesAndStops) {
     EXPECT_EQ(At(2).state, State::kStopped);
 }
 
+TEST_F(DispatcherTest, BeginsNothingWhileEverythingIsPaused) {
+    Add({"1"});
+    dispatcher.SetAtOnce(2);
+    dispatcher.Start();
+    ASSERT_TRUE(AwaitScripts(1));
+    dispatcher.PauseAll();
+    Add({"2"});
+    dispatcher.SetAtOnce(3);
+    EXPECT_EQ(runner.scripts.size(), 1U);
+    dispatcher.ResumeAll();
+    ASSERT_TRUE(AwaitScripts(2));
+}
+
 TEST_F(DispatcherTest, WaitsForMoviesThatAreStillLookedAt) {
     runner.looking.Shut();
     queue.Add({Movie("1")});

@@ -88,6 +88,9 @@ TEST(Clock, IsReadAndWritten) {
     EXPECT_EQ(ClockText(59.4), "0:59");
     EXPECT_EQ(ClockText(3599.6), "1:00:00");
     EXPECT_EQ(ClockText(-3), "0:00");
+    EXPECT_EQ(ExactClockText(62.0004), "1:02");
+    EXPECT_EQ(ExactClockText(3599.9996), "1:00:00");
+    EXPECT_EQ(ExactClockText(59.05), "0:59.05");
     const std::vector<std::pair<QString, std::optional<double>>> cases = {{"90", 90},
                                                                           {"1:30", 90},
                                                                           {" 1:02:03,5 ", 3723.5},
@@ -126,6 +129,10 @@ TEST(Names, AreThosePeopleKnow) {
     EXPECT_EQ(CodecName("pcm_s24le"), "PCM");
     EXPECT_EQ(CodecName("mov_text"), "timed text");
     EXPECT_EQ(CodecName("something_new"), "something_new");
+    EXPECT_EQ(NameOf("/m/\u202Emkv.\u2066a\u2028\nb\x1B.mkv"), "\uFFFDmkv.\uFFFDa\uFFFD\uFFFDb\uFFFD.mkv");
+    EXPECT_EQ(NameOf("/m/سفر\u200Cها 👩\u200D💻.mkv"), QStringLiteral("سفر\u200Cها 👩\u200D💻.mkv"));
+    EXPECT_EQ(ForToolTip("/m/a & b.mkv"), "/m/a & b.mkv");
+    EXPECT_EQ(ForToolTip("/m/<h1>a</h1>.mkv"), "<p>/m/&lt;h1&gt;a&lt;/h1&gt;.mkv</p>");
     EXPECT_EQ(ChannelsName("5.1(side)"), "5.1");
     EXPECT_EQ(ChannelsName("stereo"), "stereo");
 }

@@ -1,6 +1,5 @@
 // What the window's runner makes of presets and wishes.
 #include "host/convert/Formats.h"
-#include "host/window/runner/LibraryWords.h"
 #include "host/window/runner/PresetShelf.h"
 #include "host/window/runner/Translation.h"
 #include "tests/support/Folder.h"
@@ -177,19 +176,6 @@ TEST_F(RunnerTest, AsksTheLibraryToCopySoundAndToDrawSubtitles) {
     EXPECT_EQ(EstimatedRate(order, ToRequest(order)), 320'000);
 }
 
-TEST(LibraryWords, KnowWhatTheLibrarySays) {
-    movieconv::NotCarried what{"subtitles", 3, "hdmv_pgs_subtitle", "ger", "MP4 cannot hold them, MKV can"};
-    EXPECT_EQ(LineOf(what), "subtitles 3 (Blu-ray (PGS), German): MP4 cannot hold them, MKV can");
-    what = {"tags", std::nullopt, {}, {}, "AVI cannot hold MOOD, KEY and title"};
-    EXPECT_EQ(LineOf(what), "tags: AVI cannot hold MOOD, KEY and title");
-    EXPECT_EQ(SentenceOf("MP4 cannot hold \"pcm_s16le\" sound as it is; MOV, MKV can"),
-              "MP4 cannot hold “PCM” sound as it is; MOV, MKV can.");
-    const std::string odd = "cannot open \"/m/a and b %2, c.mkv\": it is a text, not a movie";
-    EXPECT_EQ(InWindowsLanguage(odd),
-              QStringLiteral("cannot open “/m/a and b %2, c.mkv”: it is a text, not a movie"));
-    EXPECT_EQ(SentenceOf("something new"), "Something new.");
-}
-
 TEST_F(RunnerTest, SavesWishesAsAPresetAndTakesThemBack) {
     Wishes wishes;
     wishes.format = "mkv";
@@ -226,7 +212,9 @@ TEST_F(RunnerTest, SavesWishesAsAPresetAndTakesThemBack) {
 TEST_F(RunnerTest, TakesAPresetFromElsewhere) {
     std::filesystem::create_directory(folder / "sticks");
     WriteFile(folder / "sticks/mine.json", kMine);
-    EXPECT_EQ(TakeIntoShelf(folder / "sticks/mine.json").name, "mine");
+    const PresetFacts taken = TakeIntoShelf(folder / "sticks/mine.json");
+    EXPECT_EQ(taken.name, "mine");
+    EXPECT_EQ(taken.complaints.filter(QStringLiteral("there is no “unknown” in presets")).size(), 1);
     std::filesystem::remove_all(folder / "sticks");
     EXPECT_EQ(OnShelf("mine").description, "Mine");
     EXPECT_FALSE(movieconv::LoadPreset("mine").preferences.quality.empty());

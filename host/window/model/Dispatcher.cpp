@@ -90,6 +90,7 @@ void Dispatcher::Start() {
         working_ = true;
         done_ = failed_ = 0;
         secondsDone_ = 0;
+        stopped_ = false;
         Q_EMIT WorkBegan();
     }
     Fill();
@@ -116,6 +117,7 @@ void Dispatcher::ResumeAll() {
         active.paused = false;
         active.run->Resume();
     }
+    Fill();
     Q_EMIT Progressed();
 }
 
@@ -136,6 +138,7 @@ void Dispatcher::Resume(quint64 id) {
     if (const auto found = active_.find(id); found != active_.end()) {
         found->second.paused = false;
         found->second.run->Resume();
+        Fill();
         Q_EMIT Progressed();
     }
 }
@@ -160,6 +163,7 @@ Totals Dispatcher::Now() const {
     Totals totals;
     totals.done = done_;
     totals.failed = failed_;
+    totals.stopped = stopped_;
     bool known = true;
     double rest = 0;
     double reached = secondsDone_;
@@ -196,9 +200,9 @@ void Dispatcher::ShowPicturesOf(quint64 id) {
     shown_ = id;
 }
 
-/// Starts what there is room for; ends the work when nothing is left.
+/// Starts what there is room for, unless all that runs is paused; ends the work when nothing is left.
 void Dispatcher::Fill() {
-    while (working_ && !stopAfterThis_ && static_cast<int>(active_.size()) < atOnce_) {
+    while (working_ && !stopAfterThis_ && !IsPaused() && static_cast<int>(active_.size()) < atOnce_) {
         // What is still looked at keeps its turn.
         const auto next =
             std::find_if(queue_.Entries().begin(), queue_.Entries().end(),
@@ -266,6 +270,7 @@ void Dispatcher::Conclude(quint64 id, const Outcome& outcome) {
     active_.erase(id);
     done_ += outcome.ending == Ending::kDone ? 1 : 0;
     failed_ += outcome.ending == Ending::kFailed ? 1 : 0;
+    stopped_ = outcome.ending == Ending::kStopped;
     queue_.Change(
         id,
         [&](Entry& entry) {

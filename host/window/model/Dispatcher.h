@@ -22,6 +22,7 @@ struct Totals {
     int failed = 0;
     double fraction = -1; ///< Of all that is to be done since work began; negative when it cannot be told.
     std::optional<double> left; ///< Seconds.
+    bool stopped = false;       ///< The user stopped the last one that ended.
 };
 
 /// Belongs to the window's thread.
@@ -95,6 +96,7 @@ private:
     int done_ = 0;
     int failed_ = 0;
     double secondsDone_ = 0;
+    bool stopped_ = false;
 };
 
 } // namespace movieconv::window

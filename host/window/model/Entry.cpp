@@ -71,8 +71,20 @@ QString Readable(const std::string& path) {
     return QString::fromStdString(path);
 }
 
+QString Shown(const std::string& text) {
+    QString shown = Readable(text);
+    for (QChar& sign : shown) {
+        const char16_t code = sign.unicode();
+        const bool turns = (code >= 0x202A && code <= 0x202E) || (code >= 0x2066 && code <= 0x2069);
+        const bool endsLine = code == 0x2028 || code == 0x2029;
+        if (turns || endsLine || sign.category() == QChar::Other_Control)
+            sign = QChar::ReplacementCharacter;
+    }
+    return shown;
+}
+
 QString NameOf(const std::string& path) {
-    return Readable(path.substr(path.rfind('/') + 1));
+    return Shown(path.substr(path.rfind('/') + 1));
 }
 
 QJsonObject ToJson(const Entry& entry) {

@@ -38,9 +38,13 @@ struct Entry {
     std::optional<double> SecondsWanted() const;
 };
 
-/// The file's name for people: bytes that are no text are replaced.
-QString NameOf(const std::string& path);
+/// A path as text; bytes that are none are replaced.
 QString Readable(const std::string& path);
+/// Likewise, for people: signs that end a line, or turn the direction in which the rest is read, are
+/// replaced.
+QString Shown(const std::string& text);
+/// The file's name, for people.
+QString NameOf(const std::string& path);
 
 /// What of an entry survives the program.
 QJsonObject ToJson(const Entry& entry);

@@ -66,7 +66,7 @@ std::vector<std::string> MoviesBelow(const std::string& folder) {
 }
 
 QString Tell(const char* text, const std::string& path) {
-    return QCoreApplication::translate("Intake", text).arg(Readable(path));
+    return QCoreApplication::translate("Intake", text).arg(Shown(path));
 }
 
 } // namespace

@@ -206,6 +206,20 @@ void Queue::SetWishesOfAll(const Wishes& wishes) {
         SetWishes(entry.id, WithOwn(wishes, entry.wishes));
 }
 
+void Queue::LookAgain(quint64 id) {
+    if (const Entry* entry = FindWaiting(id); entry == nullptr || entry->unusable.isEmpty())
+        return;
+    Change(
+        id,
+        [](Entry& entry) {
+            entry.facts.reset();
+            entry.unusable.clear();
+            entry.examined = false;
+        },
+        false);
+    Examine(id);
+}
+
 void Queue::Retry(const QList<quint64>& ids) {
     const Batch batch(*this);
     for (const quint64 id : ids) {
@@ -216,6 +230,7 @@ void Queue::Retry(const QList<quint64>& ids) {
             id,
             [](Entry& again) {
                 again.state = State::kWaiting;
+                again.facts.reset(); // it may be another movie by now, or none
                 again.examined = false;
                 again.figures = {};
                 again.outcome = {};
@@ -284,7 +299,7 @@ QVariant Queue::data(const QModelIndex& index, int role) const {
     case Qt::DisplayRole:
         return NameOf(entry.source);
     case Qt::ToolTipRole:
-        return Readable(entry.source);
+        return ForToolTip(Shown(entry.source));
     case Qt::AccessibleTextRole:
         return QStringLiteral("%1, %2").arg(NameOf(entry.source), LineOf(entry));
     case kIdRole:

@@ -57,6 +57,8 @@ public:
     void SetReplace(quint64 id, bool replace);
     /// Gives all that wait these wishes, but for what belongs to one movie alone.
     void SetWishesOfAll(const Wishes& wishes);
+    /// Finds out anew whether a movie that could not be converted can be now.
+    void LookAgain(quint64 id);
     /// Makes what is over wait again.
     void Retry(const QList<quint64>& ids);
 

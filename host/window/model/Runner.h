@@ -66,6 +66,7 @@ struct PresetFacts {
     QString extension;   ///< Of the files it makes.
     int quality = 60;    ///< On Wishes' scale, or -1 when there is nothing to choose.
     bool copiesSound = false;
+    QStringList complaints; ///< What its file asks for in vain. Sentences.
 };
 
 /// What the window need not offer where it is missing.

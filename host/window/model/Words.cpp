@@ -4,6 +4,7 @@
 
 #include <QCoreApplication>
 #include <QLocale>
+#include <QTextDocument>
 #include <QStringList>
 
 #include <algorithm>
@@ -52,6 +53,17 @@ QString ClockText(double seconds) {
         return rest.arg(QString::number(whole / 60), two(whole % 60));
     return QStringLiteral("%1:%2:%3")
         .arg(QString::number(whole / 3600), two(whole / 60 % 60), two(whole % 60));
+}
+
+QString ExactClockText(double seconds) {
+    const int64_t milliseconds = std::llround(std::max(0.0, seconds) * 1000);
+    const QString clock = ClockText(static_cast<double>(milliseconds / 1000));
+    if (milliseconds % 1000 == 0)
+        return clock;
+    QString rest = QStringLiteral("%1").arg(milliseconds % 1000, 3, 10, QLatin1Char('0'));
+    while (rest.endsWith(QLatin1Char('0')))
+        rest.chop(1);
+    return clock + QLocale().decimalPoint() + rest;
 }
 
 std::optional<double> ParseClock(const QString& text) {
@@ -119,6 +131,10 @@ QString TrackLine(const TrackFacts& track) {
     return track.details.isEmpty()
                ? parts.join(QStringLiteral(", "))
                : QStringLiteral("%1 (%2)").arg(parts.join(QStringLiteral(", ")), track.details);
+}
+
+QString ForToolTip(const QString& text) {
+    return Qt::mightBeRichText(text) ? QStringLiteral("<p>%1</p>").arg(text.toHtmlEscaped()) : text;
 }
 
 QString PhaseText(Phase phase) {

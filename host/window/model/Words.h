@@ -12,6 +12,8 @@ namespace movieconv::window {
 
 /// "0:42", "1:02:03".
 QString ClockText(double seconds);
+/// "0:42.5": to the millisecond, where it is no whole second.
+QString ExactClockText(double seconds);
 /// Seconds from "90", "1:30", "1:02:03.5"; nothing when it is no time.
 std::optional<double> ParseClock(const QString& text);
 /// "less than a minute", "about 12 minutes", "about 2 h 10 min".
@@ -23,6 +25,8 @@ QString SpeedText(double speed);
 QString FactsLine(const MovieFacts& facts);
 /// A track for people: "English, Director's comments (AAC, stereo)".
 QString TrackLine(const TrackFacts& track);
+/// Text that may hold signs of a markup language, for a tool tip, which would follow them.
+QString ForToolTip(const QString& text);
 QString PhaseText(Phase phase);
 /// What the list says about an entry below its name. `preset`: its title.
 QString StateLine(const Entry& entry, const QString& preset);

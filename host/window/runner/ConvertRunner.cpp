@@ -14,6 +14,7 @@
 
 #include <atomic>
 #include <chrono>
+#include <filesystem>
 #include <stdexcept>
 #include <system_error>
 #include <utility>
@@ -41,7 +42,8 @@ QImage ToImage(const std::shared_ptr<const ShownPicture>& picture) {
             held};
 }
 
-QString FailureSentence(const Failure& failure) {
+QString FailureSentence(const Failure& failure, const std::string& source) {
+    std::error_code unknown;
     const QString what = failure.Why() == Reason::kNoMemory && failure.Text().empty()
                              ? Texts::tr("There was not enough memory.")
                              : SentenceOf(failure.Text());
@@ -52,13 +54,16 @@ QString FailureSentence(const Failure& failure) {
         advice = Texts::tr("Make room on the disk, or choose another folder.");
     else if (failure.Kind() == Category::kOutput)
         advice = Texts::tr("Choose another folder that you may write to.");
+    else if (failure.Kind() == Category::kSource && !std::filesystem::exists(source, unknown))
+        advice = Texts::tr("Is the disk that holds it connected?");
     return advice.isEmpty() ? what : what + QLatin1Char(' ') + advice;
 }
 
 /// Hears a job and tells a listener in the window's terms.
 class Interpreter : public Observer {
 public:
-    explicit Interpreter(std::shared_ptr<RunListener> listener) : listener_(std::move(listener)) {}
+    Interpreter(std::string source, std::shared_ptr<RunListener> listener)
+        : source_(std::move(source)), listener_(std::move(listener)) {}
 
     void StopWasAskedFor() { stopping_ = true; }
 
@@ -103,13 +108,14 @@ public:
         outcome.position = verdict.position;
         outcome.worked = verdict.worked;
         if (verdict.failure)
-            outcome.sentence = FailureSentence(*verdict.failure);
+            outcome.sentence = FailureSentence(*verdict.failure, source_);
         else if (outcome.ending == Ending::kStopped && outcome.files.empty())
             outcome.sentence = Texts::tr("It was stopped before anything was converted.");
         listener_->OnEnd(outcome);
     }
 
 private:
+    const std::string source_;
     const std::shared_ptr<RunListener> listener_;
     QStringList leftBehind_;
     std::vector<std::string> files_;
@@ -150,7 +156,7 @@ public:
 private:
     struct Parts {
         Parts(const Request& request, std::shared_ptr<RunListener> listener)
-            : interpreter(std::move(listener)), job(request, interpreter) {}
+            : interpreter(request.input, std::move(listener)), job(request, interpreter) {}
         Interpreter interpreter;
         Job job;
     };
@@ -219,7 +225,7 @@ MovieFacts ConvertRunner::Look(const std::string& path) {
         request.input = path;
         return FactsOf(LookAtSource(request));
     } catch (const Failure& failure) {
-        throw std::runtime_error(SentenceOf(failure.Text()).toStdString());
+        throw std::runtime_error(FailureSentence(failure, path).toStdString());
     }
 }
 

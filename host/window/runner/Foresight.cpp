@@ -17,6 +17,7 @@
 
 #include <filesystem>
 #include <system_error>
+#include <unistd.h>
 
 namespace movieconv::window {
 namespace {
@@ -47,7 +48,7 @@ void WarnOfFiles(Findings& findings, const Wishes& wishes) {
     std::error_code unknown;
     for (const std::string& path : files)
         if (!std::filesystem::is_regular_file(path, unknown))
-            findings.warnings += ForesightTexts::tr("The subtitles “%1” were not found.").arg(Readable(path));
+            findings.warnings += ForesightTexts::tr("The subtitles “%1” were not found.").arg(Shown(path));
 }
 
 /// Wishes that others make void.
@@ -87,7 +88,7 @@ void WarnOfRoom(Findings& findings, const Order& order, const Request& request, 
     findings.free = free;
     if (free < *findings.needed) {
         findings.warnings += ForesightTexts::tr("About %1 are needed, but only %2 are free in “%3”.")
-                                 .arg(BytesText(*findings.needed), BytesText(free), Readable(folder));
+                                 .arg(BytesText(*findings.needed), BytesText(free), Shown(folder));
     }
 }
 
@@ -99,9 +100,11 @@ Findings Foresee(const Order& order) {
     const std::string folder = text::FolderOf(order.target);
     WarnOfTarget(findings, order);
     if (!std::filesystem::is_directory(folder, unknown)) {
-        findings.warnings += ForesightTexts::tr("There is no folder “%1”.").arg(Readable(folder));
+        findings.warnings += ForesightTexts::tr("There is no folder “%1”.").arg(Shown(folder));
         return findings;
     }
+    if (access(folder.c_str(), W_OK | X_OK) != 0)
+        findings.warnings += ForesightTexts::tr("You may not write to the folder “%1”.").arg(Shown(folder));
     try {
         const Request request = ToRequest(order);
         WarnOfFiles(findings, order.wishes);

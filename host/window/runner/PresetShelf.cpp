@@ -3,6 +3,7 @@
 #include "host/convert/CodecPlan.h"
 #include "host/convert/Failure.h"
 #include "host/convert/Formats.h"
+#include "host/window/runner/LibraryWords.h"
 #include "text/Path.h"
 
 #include <QCoreApplication>
@@ -117,6 +118,8 @@ PresetFacts FactsOf(const Preset& preset) {
         facts.extension = QString::fromUtf8(format->szExtensions).section(QLatin1Char(','), 0, 0);
     facts.quality = UsualQuality(preset);
     facts.copiesSound = preset.preferences.copySound;
+    for (const std::string& complaint : preset.complaints)
+        facts.complaints += SentenceOf(complaint);
     return facts;
 }
 

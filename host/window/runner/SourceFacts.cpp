@@ -1,6 +1,7 @@
 #include "host/window/runner/SourceFacts.h"
 
 #include "host/window/model/CodecNames.h"
+#include "host/window/model/Entry.h"
 
 #include <utility>
 
@@ -16,7 +17,7 @@ TrackFacts TrackOf(const StreamInfo& stream) {
     TrackFacts track;
     track.number = stream.index;
     track.language = QString::fromStdString(stream.language);
-    track.title = QString::fromStdString(stream.title);
+    track.title = Shown(stream.title);
     track.details = CodecName(QString::fromStdString(stream.codec));
     if (stream.sound && !stream.sound->layout.empty())
         track.details += QStringLiteral(", ") + ChannelsName(QString::fromStdString(stream.sound->layout));

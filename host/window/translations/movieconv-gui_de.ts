@@ -46,6 +46,10 @@
         <source>It was stopped before anything was converted.</source>
         <translation>Es wurde abgebrochen, bevor etwas umgewandelt war.</translation>
     </message>
+    <message>
+        <source>Is the disk that holds it connected?</source>
+        <translation>Ist der Datenträger angeschlossen, auf dem er liegt?</translation>
+    </message>
 </context>
 <context>
     <name>Foresight</name>
@@ -85,6 +89,10 @@
         <source>There is no folder “%1”.</source>
         <translation>Den Ordner „%1“ gibt es nicht.</translation>
     </message>
+    <message>
+        <source>You may not write to the folder “%1”.</source>
+        <translation>In den Ordner „%1“ darf nicht geschrieben werden.</translation>
+    </message>
 </context>
 <context>
     <name>FormParts</name>
@@ -121,6 +129,10 @@
     <message>
         <source>The queue cannot be saved in %1: %2. It will be lost when the program ends.</source>
         <translation>Die Warteschlange kann nicht in %1 gespeichert werden: %2. Sie geht mit dem Ende des Programms verloren.</translation>
+    </message>
+    <message>
+        <source>Another window has the saved queue. What is added here is lost when this one is closed.</source>
+        <translation>Die gespeicherte Warteschlange gehört einem anderen Fenster. Was hier hinzukommt, geht verloren, wenn dieses geschlossen wird.</translation>
     </message>
 </context>
 <context>
@@ -577,6 +589,466 @@
         <source>timecode</source>
         <translation>Zeitcode</translation>
     </message>
+    <message>
+        <source>language as %1</source>
+        <translation>die Sprache als %1</translation>
+    </message>
+    <message>
+        <source>its sound has no form that could be copied; convert it instead</source>
+        <translation>der Ton hat keine Form, die sich kopieren ließe; er muss umgewandelt werden</translation>
+    </message>
+    <message>
+        <source>there is no file format “%1”</source>
+        <translation>es gibt kein Dateiformat „%1“</translation>
+    </message>
+    <message>
+        <source>“%1” has no constant quality; give it a bit rate</source>
+        <translation>„%1“ kennt keine gleichbleibende Qualität und braucht eine Bitrate</translation>
+    </message>
+    <message>
+        <source>the quality of “%1” goes from %2 (best) to %3, not to %4</source>
+        <translation>die Qualität von „%1“ reicht von %2 (am besten) bis %3, nicht bis %4</translation>
+    </message>
+    <message>
+        <source>too little is left of the pictures of “%1”, which are %2x%3</source>
+        <translation>von den Bildern von „%1“ mit %2x%3 Punkten bleibt zu wenig übrig</translation>
+    </message>
+    <message>
+        <source>there are no pictures in the output to draw subtitles into</source>
+        <translation>in der neuen Datei gibt es keine Bilder, in die Untertitel gezeichnet werden könnten</translation>
+    </message>
+    <message>
+        <source>there are no pictures to draw subtitles into</source>
+        <translation>es gibt keine Bilder, in die Untertitel gezeichnet werden könnten</translation>
+    </message>
+    <message>
+        <source>a split needs pictures: sound alone is written as one file</source>
+        <translation>nur Filme mit Bildern lassen sich teilen; Ton allein wird eine einzige Datei</translation>
+    </message>
+    <message>
+        <source>“%1” is a link to a missing file; name that file, or remove the link</source>
+        <translation>„%1“ ist ein Verweis auf eine fehlende Datei; bitte diese Datei nennen oder den Verweis löschen</translation>
+    </message>
+    <message>
+        <source>the name of a split output needs an extension, as in “%1”</source>
+        <translation>der Name geteilter Dateien braucht eine Endung, etwa „%1“</translation>
+    </message>
+    <message>
+        <source>the name “%1” is too long to number clips; choose a shorter one</source>
+        <translation>der Name „%1“ ist zu lang, um Teile zu nummerieren; bitte einen kürzeren wählen</translation>
+    </message>
+    <message>
+        <source>the name “%1” is too long for its file system; choose a shorter one</source>
+        <translation>der Name „%1“ ist zu lang für sein Dateisystem; bitte einen kürzeren wählen</translation>
+    </message>
+    <message>
+        <source>“%1” holds no pictures and no sound that can be decoded</source>
+        <translation>„%1“ enthält weder Bilder noch Ton, die sich dekodieren lassen</translation>
+    </message>
+    <message>
+        <source>“%1” holds no pictures that can be decoded</source>
+        <translation>„%1“ enthält keine Bilder, die sich dekodieren lassen</translation>
+    </message>
+    <message>
+        <source>“%1” holds no sound that can be decoded</source>
+        <translation>„%1“ enthält keinen Ton, der sich dekodieren lässt</translation>
+    </message>
+    <message>
+        <source>cannot read “%1” from its start again</source>
+        <translation>„%1“ lässt sich nicht noch einmal von vorn lesen</translation>
+    </message>
+    <message>
+        <source>cannot start the decoder %1: %2</source>
+        <translation>der Decoder %1 lässt sich nicht starten: %2</translation>
+    </message>
+    <message>
+        <source>it is not a movie, or its index is missing because it was never finished</source>
+        <translation>es ist kein Film, oder sein Index fehlt, weil er nie fertig geschrieben wurde</translation>
+    </message>
+    <message>
+        <source>it names “%1” over and over</source>
+        <translation>es nennt „%1“ immer wieder</translation>
+    </message>
+    <message>
+        <source>it names “%1”: %2</source>
+        <translation>es nennt „%1“: %2</translation>
+    </message>
+    <message>
+        <source>it names “%1”, another file</source>
+        <translation>es nennt eine andere Datei, „%1“</translation>
+    </message>
+    <message>
+        <source>it names “%1”, which is not a file&apos;s name</source>
+        <translation>es nennt „%1“, was kein Dateiname ist</translation>
+    </message>
+    <message>
+        <source>it names “%1”, which does not exist</source>
+        <translation>es nennt „%1“, was es nicht gibt</translation>
+    </message>
+    <message>
+        <source>it names “%1”, which lies outside its folder</source>
+        <translation>es nennt „%1“, was außerhalb seines Ordners liegt</translation>
+    </message>
+    <message>
+        <source>it names “%1”, which is no regular file</source>
+        <translation>es nennt „%1“, was keine gewöhnliche Datei ist</translation>
+    </message>
+    <message>
+        <source>its borders cannot be looked for: %1</source>
+        <translation>die Ränder lassen sich nicht suchen: %1</translation>
+    </message>
+    <message>
+        <source>its pictures cannot be filtered: %1</source>
+        <translation>die Bilder lassen sich nicht filtern: %1</translation>
+    </message>
+    <message>
+        <source>the file was cut meanwhile</source>
+        <translation>die Datei wurde inzwischen gekürzt</translation>
+    </message>
+    <message>
+        <source>it is cut off: it ends at %1 although it announces %2</source>
+        <translation>sie ist abgeschnitten: sie endet bei %1, obwohl sie %2 ankündigt</translation>
+    </message>
+    <message>
+        <source>it ends at %1 although it announces %2</source>
+        <translation>sie endet bei %1, obwohl sie %2 ankündigt</translation>
+    </message>
+    <message>
+        <source>it is cut off</source>
+        <translation>sie ist abgeschnitten</translation>
+    </message>
+    <message>
+        <source>it cannot be read from its start again</source>
+        <translation>sie lässt sich nicht noch einmal von vorn lesen</translation>
+    </message>
+    <message>
+        <source>the subtitles cannot be decoded: %1</source>
+        <translation>die Untertitel lassen sich nicht dekodieren: %1</translation>
+    </message>
+    <message>
+        <source>the subtitles cannot be drawn: %1</source>
+        <translation>die Untertitel lassen sich nicht zeichnen: %1</translation>
+    </message>
+    <message>
+        <source>the subtitles of a pipe cannot be drawn into its pictures</source>
+        <translation>Untertitel aus einer Pipe lassen sich nicht in ihre Bilder zeichnen</translation>
+    </message>
+    <message>
+        <source>the subtitles %1 are not there any more</source>
+        <translation>die Untertitel %1 gibt es nicht mehr</translation>
+    </message>
+    <message>
+        <source>the subtitles cannot be read ahead of the pictures</source>
+        <translation>die Untertitel lassen sich nicht vor den Bildern lesen</translation>
+    </message>
+    <message>
+        <source>cannot make a folder for the subtitles: %1</source>
+        <translation>für die Untertitel lässt sich kein Ordner anlegen: %1</translation>
+    </message>
+    <message>
+        <source>cannot write the subtitles to “%1”</source>
+        <translation>die Untertitel lassen sich nicht nach „%1“ schreiben</translation>
+    </message>
+    <message>
+        <source>cannot read subtitles from “%1”: %2</source>
+        <translation>aus „%1“ lassen sich keine Untertitel lesen: %2</translation>
+    </message>
+    <message>
+        <source>it holds none of text</source>
+        <translation>es enthält keine aus Text</translation>
+    </message>
+    <message>
+        <source>it is too large for subtitles</source>
+        <translation>es ist zu groß für Untertitel</translation>
+    </message>
+    <message>
+        <source>it is not in the character set “%1”</source>
+        <translation>es ist nicht im Zeichensatz „%1“</translation>
+    </message>
+    <message>
+        <source>there is no character set “%1”</source>
+        <translation>es gibt keinen Zeichensatz „%1“</translation>
+    </message>
+    <message>
+        <source>%1; %2 were written, %3 are free: make room or choose another disk</source>
+        <translation>%1; %2 wurden geschrieben, %3 sind frei: bitte Platz schaffen oder einen anderen Datenträger wählen</translation>
+    </message>
+    <message>
+        <source>Writing to “%1” failed after %2 bytes: %3</source>
+        <translation>das Schreiben nach „%1“ misslang nach %2 Byte: %3</translation>
+    </message>
+    <message>
+        <source>Syncing “%1” failed: %2</source>
+        <translation>das Sichern von „%1“ auf dem Datenträger misslang: %2</translation>
+    </message>
+    <message>
+        <source>Renaming “%1” failed: %2</source>
+        <translation>das Umbenennen von „%1“ misslang: %2</translation>
+    </message>
+    <message>
+        <source>No file can be created in the folder “%1”: %2</source>
+        <translation>im Ordner „%1“ lässt sich keine Datei anlegen: %2</translation>
+    </message>
+    <message>
+        <source>Another conversion is writing this file (%1)</source>
+        <translation>eine andere Umwandlung schreibt diese Datei (%1)</translation>
+    </message>
+    <message>
+        <source>The file exists already (%1)</source>
+        <translation>die Datei gibt es schon (%1)</translation>
+    </message>
+    <message>
+        <source>The encoder for “%1” does not accept %2: %3</source>
+        <translation>der Encoder für „%1“ nimmt %2 nicht an: %3</translation>
+    </message>
+    <message>
+        <source>The encoder %1 failed: %2</source>
+        <translation>der Encoder %1 versagte: %2</translation>
+    </message>
+    <message>
+        <source>Pictures of %1x%2 cannot be written; choose another size</source>
+        <translation>Bilder mit %1x%2 Punkten lassen sich nicht schreiben; bitte eine andere Größe wählen</translation>
+    </message>
+    <message>
+        <source>There is not enough memory</source>
+        <translation>der Arbeitsspeicher reicht nicht</translation>
+    </message>
+    <message>
+        <source>No thread can be started: %1</source>
+        <translation>es lässt sich kein Thread starten: %1</translation>
+    </message>
+    <message>
+        <source>the media writer gave no reason</source>
+        <translation>ein Grund wurde nicht genannt</translation>
+    </message>
+    <message>
+        <source>“%1” holds %2 s of pictures, but %3 s were sent into it</source>
+        <translation>„%1“ enthält %2 s an Bildern, aber %3 s wurden hineingegeben</translation>
+    </message>
+    <message>
+        <source>“%1” holds %2 s of sound, but %3 s were sent into it</source>
+        <translation>„%1“ enthält %2 s an Ton, aber %3 s wurden hineingegeben</translation>
+    </message>
+    <message>
+        <source>“%1” has %2 bytes, but %3 were written into it</source>
+        <translation>„%1“ hat %2 Byte, aber %3 wurden hineingeschrieben</translation>
+    </message>
+    <message>
+        <source>“%1” has become larger than asked for: %2</source>
+        <translation>„%1“ ist größer geworden als gewünscht: %2</translation>
+    </message>
+    <message>
+        <source>the conversion broke off after %1, for want of memory</source>
+        <translation>die Umwandlung brach nach %1 ab, weil der Arbeitsspeicher nicht reichte</translation>
+    </message>
+    <message>
+        <source>the conversion could not be started</source>
+        <translation>die Umwandlung ließ sich nicht starten</translation>
+    </message>
+    <message>
+        <source>no thread could be started for the conversion</source>
+        <translation>für die Umwandlung ließ sich kein Thread starten</translation>
+    </message>
+    <message>
+        <source>no thread can be started: %1</source>
+        <translation>es lässt sich kein Thread starten: %1</translation>
+    </message>
+    <message>
+        <source>no memory for the converter</source>
+        <translation>der Arbeitsspeicher reicht nicht für die Umwandlung</translation>
+    </message>
+    <message>
+        <source>no memory</source>
+        <translation>der Arbeitsspeicher reicht nicht</translation>
+    </message>
+    <message>
+        <source>Invalid data found when processing input</source>
+        <translation>die Daten sind ungültig</translation>
+    </message>
+    <message>
+        <source>Generic error in an external library</source>
+        <translation>Fehler in einer fremden Bibliothek</translation>
+    </message>
+    <message>
+        <source>Unknown error occurred</source>
+        <translation>unbekannter Fehler</translation>
+    </message>
+    <message>
+        <source>“%1” needs about %2 to %3 more, but only %4 are free</source>
+        <translation>„%1“ braucht noch etwa %2 bis %3, aber nur %4 sind frei</translation>
+    </message>
+    <message>
+        <source>the pictures are cropped to %1x%2: %3 above, %4 below, %5 left, %6 right</source>
+        <translation>die Bilder sind auf %1x%2 Punkte beschnitten: %3 oben, %4 unten, %5 links, %6 rechts</translation>
+    </message>
+    <message>
+        <source>1 of its subtitles was not in UTF-8 and taken for Windows-1252</source>
+        <translation>1 Untertitel war nicht in UTF-8 und wurde als Windows-1252 gelesen</translation>
+    </message>
+    <message>
+        <source>%1 of its subtitles were not in UTF-8 and taken for Windows-1252</source>
+        <translation>%1 Untertitel waren nicht in UTF-8 und wurden als Windows-1252 gelesen</translation>
+    </message>
+    <message>
+        <source>interlaced pictures were made progressive</source>
+        <translation>Halbbilder wurden zu Vollbildern gemacht</translation>
+    </message>
+    <message>
+        <source>its HDR pictures were brought to the light and colours of BT.709</source>
+        <translation>die HDR-Bilder wurden auf Licht und Farben von BT.709 gebracht</translation>
+    </message>
+    <message>
+        <source>its pictures of %1 bits got 8</source>
+        <translation>die Bilder mit %1 Bit bekamen 8</translation>
+    </message>
+    <message>
+        <source>its %1 pictures keep their colours at half the resolution (4:2:0)</source>
+        <translation>die Bilder in %1 behalten ihre Farben in halber Auflösung (4:2:0)</translation>
+    </message>
+    <message>
+        <source>the transparency of its pictures was left out</source>
+        <translation>die Durchsichtigkeit der Bilder wurde weggelassen</translation>
+    </message>
+    <message>
+        <source>the source&apos;s clock jumped once; the parts were joined</source>
+        <translation>die Zeit der Quelle sprang einmal; die Stücke wurden aneinandergefügt</translation>
+    </message>
+    <message>
+        <source>the source&apos;s clock jumped %1 times; the parts were joined</source>
+        <translation>die Zeit der Quelle sprang %1-mal; die Stücke wurden aneinandergefügt</translation>
+    </message>
+    <message>
+        <source>%1 damaged pieces of picture data were skipped</source>
+        <translation>beschädigte Stücke der Bilddaten wurden übersprungen: %1</translation>
+    </message>
+    <message>
+        <source>%1 damaged pieces of sound data were skipped</source>
+        <translation>beschädigte Stücke der Tondaten wurden übersprungen: %1</translation>
+    </message>
+    <message>
+        <source>%1 pictures had a missing or falling time stamp</source>
+        <translation>Bilder ohne oder mit rückwärts laufendem Zeitstempel: %1</translation>
+    </message>
+    <message>
+        <source>the sound had %1 gaps or overlaps, which were closed</source>
+        <translation>Lücken oder Überlappungen im Ton wurden geschlossen: %1</translation>
+    </message>
+    <message>
+        <source>%1: the parent “%2” has this preset as a parent itself</source>
+        <translation>%1: die Grundlage „%2“ hat diese Vorlage selbst als Grundlage</translation>
+    </message>
+    <message>
+        <source>%1: there is no preset “%2”</source>
+        <translation>%1: es gibt keine Vorlage „%2“</translation>
+    </message>
+    <message>
+        <source>there is no preset “%1”</source>
+        <translation>es gibt keine Vorlage „%1“</translation>
+    </message>
+    <message>
+        <source>%1: “%2” is there twice</source>
+        <translation>%1: „%2“ steht zweimal da</translation>
+    </message>
+    <message>
+        <source>%1: this is no JSON: %2</source>
+        <translation>%1: das ist kein JSON: %2</translation>
+    </message>
+    <message>
+        <source>cannot read the preset “%1”: %2</source>
+        <translation>die Vorlage „%1“ lässt sich nicht lesen: %2</translation>
+    </message>
+    <message>
+        <source>“%1” is too large for a preset</source>
+        <translation>„%1“ ist zu groß für eine Vorlage</translation>
+    </message>
+    <message>
+        <source>a preset has a name</source>
+        <translation>eine Vorlage hat einen Namen</translation>
+    </message>
+    <message>
+        <source>%1: “%2” has to be %3</source>
+        <translation>%1: „%2“ muss %3 sein</translation>
+    </message>
+    <message>
+        <source>a text</source>
+        <translation>ein Text</translation>
+    </message>
+    <message>
+        <source>the name of a preset, or null</source>
+        <translation>der Name einer Vorlage oder null</translation>
+    </message>
+    <message>
+        <source>a format&apos;s code or extension</source>
+        <translation>das Kürzel oder die Endung eines Formats</translation>
+    </message>
+    <message>
+        <source>an object, in braces</source>
+        <translation>ein Objekt in geschweiften Klammern</translation>
+    </message>
+    <message>
+        <source>a codec&apos;s code of up to four characters, or a list of them</source>
+        <translation>das Kürzel eines Codecs mit bis zu vier Zeichen oder eine Liste davon</translation>
+    </message>
+    <message>
+        <source>a number from 0 to 63, or such numbers by picture height or codec</source>
+        <translation>eine Zahl von 0 bis 63, oder solche Zahlen nach Bildhöhe oder Codec</translation>
+    </message>
+    <message>
+        <source>a bit rate such as “%1”, or such rates by number of channels</source>
+        <translation>eine Bitrate wie „%1“, oder solche Raten nach Zahl der Kanäle</translation>
+    </message>
+    <message>
+        <source>a bit rate such as “%1”</source>
+        <translation>eine Bitrate wie „%1“</translation>
+    </message>
+    <message>
+        <source>a frame rate up to %1, such as 25 or “%2”</source>
+        <translation>eine Bildrate bis %1, etwa 25 oder „%2“</translation>
+    </message>
+    <message>
+        <source>slowest, slower, slow, medium, fast, faster or fastest</source>
+        <translation>slowest, slower, slow, medium, fast, faster oder fastest</translation>
+    </message>
+    <message>
+        <source>baseline, main or high</source>
+        <translation>baseline, main oder high</translation>
+    </message>
+    <message>
+        <source>a size such as “%1”</source>
+        <translation>eine Größe wie „%1“</translation>
+    </message>
+    <message>
+        <source>true or false</source>
+        <translation>true oder false</translation>
+    </message>
+    <message>
+        <source>“%1”: %2</source>
+        <translation>„%1“: %2</translation>
+    </message>
+    <message>
+        <source>none</source>
+        <translation>keine</translation>
+    </message>
+    <message>
+        <source>input failed</source>
+        <translation>das Lesen misslang</translation>
+    </message>
+    <message>
+        <source>%1:1: a preset is a JSON object, in braces</source>
+        <translation type="unfinished">%1: eine Vorlage ist ein JSON-Objekt in geschweiften Klammern {1:1:?}</translation>
+    </message>
+    <message>
+        <source>a number from 1 to 8</source>
+        <translation>eine Zahl von 1 bis 8</translation>
+    </message>
+    <message>
+        <source>a number from 4000 to 384000</source>
+        <translation>eine Zahl von 4000 bis 384000</translation>
+    </message>
+    <message>
+        <source>%1: there is no “%2” in presets; it has no effect</source>
+        <translation>%1: „%2“ gibt es in Vorlagen nicht; es bewirkt nichts</translation>
+    </message>
 </context>
 <context>
     <name>LogShare</name>
@@ -1018,6 +1490,14 @@
         <source>Everything</source>
         <translation>Alles</translation>
     </message>
+    <message>
+        <source>Look &amp;again</source>
+        <translation>&amp;Noch einmal prüfen</translation>
+    </message>
+    <message>
+        <source>Finds out whether the movie can be converted now</source>
+        <translation>Prüft, ob der Film sich jetzt umwandeln lässt</translation>
+    </message>
 </context>
 <context>
     <name>movieconv::window::LogPanel</name>
@@ -1354,6 +1834,10 @@
     <message>
         <source>Converts all movies that wait</source>
         <translation>Wandelt alle wartenden Filme um</translation>
+    </message>
+    <message>
+        <source>closes when done</source>
+        <translation>schließt danach</translation>
     </message>
 </context>
 <context>

@@ -97,7 +97,7 @@ void EntryDelegate::paint(QPainter* painter, const QStyleOptionViewItem& option,
     painter->setFont(strong);
     painter->setPen(palette.color(QPalette::Text));
     painter->drawText(QRect(left, top, width, strongMetrics.height()), Qt::AlignLeft | Qt::AlignVCenter,
-                      strongMetrics.elidedText(index.data().toString().simplified(), Qt::ElideMiddle, width));
+                      strongMetrics.elidedText(index.data().toString(), Qt::ElideMiddle, width));
     painter->setFont(option.font);
     painter->setPen(entry.state == State::kFailed ? BadColour(palette) : DimColour(palette));
     painter->drawText(QRect(left, top + strongMetrics.height() + 2, width, metrics.height()),

@@ -72,8 +72,8 @@ void RangeChoice::Show(const Entry& entry) {
 void RangeChoice::ShowTimes() {
     const Wishes& wishes = entry_.wishes;
     const double length = entry_.facts ? entry_.facts->seconds : 0;
-    begin_->setText(ClockText(wishes.begin));
-    end_->setText(wishes.end ? ClockText(*wishes.end) : length > 0 ? ClockText(length) : QString());
+    begin_->setText(ExactClockText(wishes.begin));
+    end_->setText(wishes.end ? ExactClockText(*wishes.end) : length > 0 ? ClockText(length) : QString());
 }
 
 void RangeChoice::ChooseTimes() {

@@ -72,7 +72,8 @@ double RangeStrip::XOf(double seconds) const {
 
 double RangeStrip::TimeAt(double x) const {
     const QRectF band = Band();
-    return std::clamp((x - band.left()) / band.width(), 0.0, 1.0) * length_;
+    const double seconds = std::clamp((x - band.left()) / band.width(), 0.0, 1.0) * length_;
+    return std::round(seconds * 1000) / 1000; // as the fields beside it show it
 }
 
 void RangeStrip::paintEvent(QPaintEvent*) {

@@ -2,6 +2,7 @@
 
 #include "host/window/model/Entry.h"
 #include "host/window/model/Languages.h"
+#include "host/window/model/Words.h"
 #include "host/window/widgets/FormParts.h"
 #include "host/window/widgets/Icons.h"
 
@@ -46,7 +47,7 @@ void SubtitleFiles::AddRow(size_t number) {
     auto* label =
         new QLabel(fontMetrics().elidedText(name, Qt::ElideMiddle, fontMetrics().averageCharWidth() * 18));
     label->setTextFormat(Qt::PlainText);
-    label->setToolTip(Readable(file.path));
+    label->setToolTip(ForToolTip(Shown(file.path)));
     auto* language = new QComboBox;
     AllowNarrow(*language);
     language->setAccessibleName(tr("Language of %1").arg(name));

@@ -12,6 +12,11 @@ namespace {
 
 constexpr qsizetype kMany = 4;
 
+/// An "&" in a title marks no key.
+QString WordsOf(const TrackFacts& track) {
+    return TrackLine(track).replace(QLatin1Char('&'), QLatin1String("&&"));
+}
+
 } // namespace
 
 TrackChoice::TrackChoice(const QString& name, QWidget* parent)
@@ -35,7 +40,7 @@ void TrackChoice::Show(const std::vector<TrackFacts>& tracks, const std::optiona
     apart_ = apart;
     bool same = static_cast<size_t>(checks_.size()) == tracks.size();
     for (qsizetype i = 0; same && i < checks_.size(); ++i)
-        same = checks_[i]->text() == TrackLine(tracks[static_cast<size_t>(i)]);
+        same = checks_[i]->text() == WordsOf(tracks[static_cast<size_t>(i)]);
     if (!same)
         Fill(tracks);
     filling_ = true;
@@ -51,7 +56,7 @@ void TrackChoice::Fill(const std::vector<TrackFacts>& tracks) {
     qDeleteAll(checks_);
     checks_.clear();
     for (const TrackFacts& track : tracks) {
-        auto* check = new QCheckBox(TrackLine(track));
+        auto* check = new QCheckBox(WordsOf(track));
         connect(check, &QCheckBox::toggled, this, [this] {
             if (!filling_)
                 Tell();
