@@ -3,9 +3,7 @@
 #include "host/window/widgets/Look.h"
 
 #include <QApplication>
-#include <QDesktopServices>
 #include <QStyle>
-#include <QUrl>
 
 namespace movieconv::window {
 
@@ -28,8 +26,7 @@ App::App(Runner& runner, Settings& settings, const std::string& journal)
     connect(&notifier_, &Notifier::Chosen, this, &App::Raise);
     connect(&window_, &MainWindow::Closed, qApp, &QApplication::quit);
     connect(&window_, &MainWindow::FolderWanted, &ShowInFolder);
-    connect(&window_, &MainWindow::FileWanted,
-            [](const QString& path) { QDesktopServices::openUrl(QUrl::fromLocalFile(path)); });
+    connect(&window_, &MainWindow::FileWanted, &OpenFile);
     // Where a desktop brings a style, it brings the palette as well.
     if (QApplication::style()->name() == QLatin1String("fusion")) {
         connect(&colours_, &ColourWish::Told, this,
@@ -48,6 +45,12 @@ void App::Begin(const std::vector<std::string>& movies) {
     window_.show();
 }
 
+void App::Take(const std::vector<std::string>& movies) {
+    if (!movies.empty())
+        queue_.Add(movies);
+    Raise();
+}
+
 void App::EndSoon() {
     ending_ = true;
     if (dispatcher_.IsWorking())
@@ -64,8 +67,8 @@ void App::OnWorkEnded(const Totals& totals) {
     guard_.Release();
     if (ending_)
         QApplication::quit();
-    if (ending_ || totals.done + totals.failed == 0)
-        return;
+    if (ending_ || totals.stopped || totals.done + totals.failed == 0)
+        return; // who has just stopped it knows
     const AtEnd atEnd = settings_.LoadAtEnd();
     const QString text = totals.failed == 0
                              ? tr("%n movies were converted.", "", totals.done)

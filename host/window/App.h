@@ -25,6 +25,8 @@ public:
 
     /// Shows the window, with the queue as it was and these movies behind it.
     void Begin(const std::vector<std::string>& movies);
+    /// Adds these movies, and shows the window above others.
+    void Take(const std::vector<std::string>& movies);
     /// Keeps what is done, then ends the program: nobody can be asked.
     void EndSoon();
 

@@ -1,4 +1,5 @@
 #include "host/window/App.h"
+#include "host/window/desktop/Instance.h"
 #include "host/window/runner/ConvertRunner.h"
 
 #include <QApplication>
@@ -79,6 +80,10 @@ int main(int argc, char** argv) {
     QApplication::setQuitOnLastWindowClosed(false); // the window tells when it is closed
     QApplication::setWindowIcon(
         QIcon::fromTheme(QStringLiteral("org.movieconv.MovieConv"), QIcon(QStringLiteral(":/icon.svg"))));
+    const std::vector<std::string> movies = MoviesOf(argc, argv);
+    Instance instance;
+    if (instance.HandOver(movies))
+        return 0;
     QTranslator own;
     QTranslator toolkit;
     if (toolkit.load(QLocale(), QStringLiteral("qtbase"), QStringLiteral("_"),
@@ -92,6 +97,7 @@ int main(int argc, char** argv) {
     ConvertRunner runner;
     App app(runner, settings, Journal::UsualPath());
     WatchSignals(app);
-    app.Begin(MoviesOf(argc, argv));
+    QObject::connect(&instance, &Instance::Asked, &app, &App::Take);
+    app.Begin(movies);
     return QApplication::exec();
 }

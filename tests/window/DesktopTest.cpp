@@ -1,5 +1,6 @@
 // What is asked of the desktop, on a bus of the test's own where stand-ins answer.
 #include "host/window/desktop/Desktop.h"
+#include "host/window/desktop/Instance.h"
 #include "tests/window/ScriptedRunner.h"
 
 #include <gtest/gtest.h>
@@ -10,6 +11,7 @@
 #include <QVariantMap>
 
 #include <array>
+#include <memory>
 #include <poll.h>
 #include <unistd.h>
 
@@ -163,8 +165,27 @@ TEST_F(OnABus, TheEndIsTold) {
     EXPECT_FALSE(desktop.hints.contains("sound-name"));
     Suspend();
     EXPECT_TRUE(Awaits("suspend"));
-    ShowInFolder(QStringLiteral("/m/ü 1.mp4"));
-    EXPECT_TRUE(Awaits("show file:///m/%C3%BC%201.mp4"));
+    ShowInFolder("/m/ü 1\xFF.mp4");
+    EXPECT_TRUE(Awaits("show file:///m/%C3%BC%201%FF.mp4"));
+}
+
+TEST_F(OnABus, ASecondProgramHandsItsMoviesToTheFirst) {
+    const auto connection = [](const char* name) {
+        return QDBusConnection::connectToBus(QDBusConnection::SessionBus, QLatin1String(name));
+    };
+    auto first = std::make_unique<Instance>(connection("first"));
+    std::vector<std::vector<std::string>> asked;
+    QObject::connect(first.get(), &Instance::Asked, [&](const auto& movies) { asked.push_back(movies); });
+    EXPECT_FALSE(first->HandOver({"/m/a.mkv"})) << "it is the only one";
+    const std::vector<std::string> movies{"/m/ü %1\xFF\n.mkv", "/m/b.mkv"};
+    EXPECT_TRUE(Instance(connection("second")).HandOver(movies));
+    EXPECT_TRUE(Instance(connection("third")).HandOver({}));
+    EXPECT_EQ(asked, (std::vector{movies, {}}));
+    first.reset();
+    QDBusConnection::disconnectFromBus(QStringLiteral("first"));
+    EXPECT_TRUE(Await([&] { return !Instance(connection("fourth")).HandOver({}); })) << "the first has ended";
+    for (const char* name : {"second", "third", "fourth"})
+        QDBusConnection::disconnectFromBus(QLatin1String(name));
 }
 
 TEST_F(OnABus, LightAndDarkFollowTheDesktop) {

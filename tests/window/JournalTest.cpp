@@ -8,7 +8,9 @@
 
 #include <atomic>
 #include <csignal>
+#include <fcntl.h>
 #include <filesystem>
+#include <unistd.h>
 
 using namespace movieconv::window;
 
@@ -20,6 +22,31 @@ std::vector<Entry> Load(const std::string& path) {
     QString complaint;
     return Journal(path, Ignore).Load(complaint);
 }
+
+/// Another program that has a journal until it is ended.
+class Owner {
+public:
+    explicit Owner(const std::string& journal) : child_(fork()) {
+        if (child_ != 0)
+            return;
+        const int lock = open((journal + ".lock").c_str(), O_RDWR | O_CREAT | O_CLOEXEC, 0600);
+        struct flock whole {};
+        whole.l_type = F_WRLCK;
+        fcntl(lock, F_SETLK, &whole);
+        close(open((journal + ".held").c_str(), O_WRONLY | O_CREAT | O_CLOEXEC, 0600));
+        for (;;)
+            pause();
+    }
+    Owner(const Owner&) = delete;
+    Owner& operator=(const Owner&) = delete;
+    ~Owner() {
+        kill(child_, SIGKILL);
+        AwaitEnd(child_);
+    }
+
+private:
+    const pid_t child_;
+};
 
 Entry FullEntry() {
     Entry entry;
@@ -171,4 +198,23 @@ TEST(Journal, IsWholeAtWhateverMomentTheProgramIsKilled) {
         EXPECT_EQ(Journal(path, Ignore).Load(complaint).size(), entries.size());
         EXPECT_TRUE(complaint.isEmpty());
     }
+}
+
+TEST(Journal, BelongsToOneProgram) {
+    const Folder folder;
+    const std::string path = folder / "queue";
+    { Journal(path, Ignore).Keep({FullEntry()}); }
+    const std::string before = ReadFile(path);
+    {
+        const Owner other(path);
+        ASSERT_TRUE(Await([&] { return std::filesystem::exists(path + ".held"); }));
+        Journal second(path, Ignore);
+        QString complaint;
+        EXPECT_TRUE(second.Load(complaint).empty());
+        EXPECT_FALSE(complaint.isEmpty());
+        second.Keep({});
+        second.Settle();
+        EXPECT_EQ(ReadFile(path), before);
+    }
+    EXPECT_EQ(Load(path).size(), 1U) << "once it is gone";
 }

@@ -1,5 +1,6 @@
 // Whether everything in the window can be reached, read and named.
 #include "host/window/widgets/EntryPage.h"
+#include "host/window/widgets/Look.h"
 #include "host/window/widgets/NamingDialog.h"
 #include "tests/window/WindowBench.h"
 
@@ -12,6 +13,8 @@
 #include <QToolButton>
 #include <QTranslator>
 
+#include <algorithm>
+#include <cmath>
 #include <map>
 #include <set>
 
@@ -166,6 +169,38 @@ TEST_F(WindowAccessTest, HasRoomForEveryWordInEveryLanguage) {
         QApplication::removeTranslator(&translator);
     }
     Begin();
+}
+
+namespace {
+
+/// By which people with weak sight tell a colour from another one: 1 for the same, 21 for black and white.
+double Contrast(const QColor& one, const QColor& other) {
+    const auto light = [](const QColor& colour) {
+        const auto linear = [](double share) { return std::pow(share, 2.2); };
+        return 0.2126 * linear(colour.redF()) + 0.7152 * linear(colour.greenF()) +
+               0.0722 * linear(colour.blueF()) + 0.05;
+    };
+    return std::max(light(one), light(other)) / std::min(light(one), light(other));
+}
+
+} // namespace
+
+TEST_F(WindowAccessTest, StaysReadableWhenTheSystemTurnsDarkOrLight) {
+    const auto faint = [&] {
+        QStringList words;
+        for (const QLabel* label : Window().findChildren<QLabel*>())
+            if (label->isVisible() && Contrast(label->palette().color(QPalette::WindowText),
+                                               QApplication::palette().color(QPalette::Window)) < 4)
+                words += label->text();
+        return words.join(QStringLiteral("\n")).toStdString();
+    };
+    Add({"a.mkv"});
+    Act("start");
+    ASSERT_TRUE(AwaitScripts(1));
+    for (const bool dark : {true, false}) {
+        QApplication::setPalette(OwnPalette(dark));
+        EXPECT_TRUE(Await([&] { return faint().empty(); })) << (dark ? "dark:\n" : "light:\n") << faint();
+    }
 }
 
 TEST_F(WindowAccessTest, ReachesEveryControlByTab) {

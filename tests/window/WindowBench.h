@@ -120,14 +120,15 @@ struct WindowBench : testing::Test {
         return The<Page>()->isVisible();
     }
 
-    void Drop(const QByteArray& uris) {
+    void Drop(const QByteArray& uris, QWidget* place = nullptr) {
         QMimeData data;
         data.setData(QStringLiteral("text/uri-list"), uris);
         QDragEnterEvent enter({300, 300}, Qt::CopyAction, &data, Qt::LeftButton, Qt::NoModifier);
-        QApplication::sendEvent(&Window(), &enter);
+        QWidget* target = place == nullptr ? &Window() : place;
+        QApplication::sendEvent(target, &enter);
         ASSERT_TRUE(enter.isAccepted());
         QDropEvent drop({300, 300}, Qt::CopyAction, &data, Qt::LeftButton, Qt::NoModifier);
-        QApplication::sendEvent(&Window(), &drop);
+        QApplication::sendEvent(target, &drop);
     }
 };
 

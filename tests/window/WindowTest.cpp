@@ -1,5 +1,6 @@
 // Every action of the window, over a scripted runner.
 #include "host/window/widgets/EntryPage.h"
+#include "host/window/widgets/Look.h"
 #include "host/window/widgets/NamingDialog.h"
 #include "host/window/widgets/OverPage.h"
 #include "host/window/widgets/RangeStrip.h"
@@ -46,8 +47,18 @@ TEST_F(WindowTest, TakesWhatIsDropped) {
     ASSERT_TRUE(Await([&] { return app->TheQueue().Entries().size() == 2 && !At(1).unusable.isEmpty(); }));
     EXPECT_EQ(At(0).source, folder / "ü %.mkv");
     EXPECT_TRUE(Tells("example.org"));
+    auto* target = Named<QLineEdit>("File to save as");
+    const QString before = target->text();
+    Drop("file://" + QByteArray::fromStdString(Movie("b.mkv")), target);
+    ASSERT_TRUE(Await([&] { return app->TheQueue().Entries().size() == 3; })) << "also on a field of text";
+    EXPECT_EQ(target->text(), before);
+    Select(2);
+    Act("remove");
     Select(1);
     EXPECT_TRUE(Named<QLabel>("Why it cannot be converted")->isVisible());
+    WriteFile(folder / "words.txt", "movie");
+    Click("Look again");
+    ASSERT_TRUE(Await([&] { return At(1).IsStartable(); }));
     Act("remove");
     EXPECT_EQ(app->TheQueue().Entries().size(), 1U);
 }
@@ -322,7 +333,7 @@ TEST_F(WindowTest, OpensWhatWasConverted) {
     Act("play");
     Click("Show in folder");
     Act("folder");
-    const QList<QVariant> wanted{QString::fromStdString(folder / "a.mp4")};
+    const QList<QVariant> wanted{QVariant::fromValue(folder / "a.mp4")};
     EXPECT_EQ(QList<QList<QVariant>>(files), QList({wanted, wanted}));
     EXPECT_EQ(QList<QList<QVariant>>(folders), QList({wanted, wanted}));
     Act("again");
@@ -372,6 +383,12 @@ TEST_F(WindowTest, ShowsFailuresWithTheirLog) {
     const auto* log = The<OverPage>()->findChild<QWidget*>(QStringLiteral("log"));
     ASSERT_NE(log, nullptr);
     EXPECT_TRUE(log->isVisible());
+    const auto sign = [&] { return Named<QWidget>("State")->grab().toImage(); };
+    const QImage light = sign();
+    QApplication::setPalette(OwnPalette(true));
+    EXPECT_TRUE(Await([&] { return sign() != light; })) << "its colour is not that of dark windows";
+    QApplication::setPalette(OwnPalette(false));
+    EXPECT_TRUE(Await([&] { return sign() == light; }));
     Click("Convert again");
     EXPECT_EQ(At(0).state, State::kWaiting);
     EXPECT_TRUE(Shows<EntryPage>());
@@ -452,7 +469,15 @@ TEST_F(WindowTest, RemembersWhatHappensAtTheEnd) {
     Add({"a.mkv"});
     Act("start");
     ASSERT_TRUE(AwaitScripts(1));
-    Script(0).End(Ending::kDone);
+    Act("stop"); // whoever stops is there, and wants no end
+    ASSERT_TRUE(Await([&] { return !app->TheDispatcher().IsWorking(); }));
+    QApplication::processEvents();
+    EXPECT_TRUE(closed.isEmpty());
+    Act("again");
+    ASSERT_TRUE(Await([&] { return At(0).IsStartable(); }));
+    Act("start");
+    ASSERT_TRUE(AwaitScripts(2));
+    Script(1).End(Ending::kDone);
     EXPECT_TRUE(Await([&] { return !closed.isEmpty(); }));
 }
 

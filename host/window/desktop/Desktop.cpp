@@ -1,14 +1,14 @@
 #include "host/window/desktop/Desktop.h"
 
+#include "text/Path.h"
+
 #include <QCoreApplication>
 #include <QDBusConnection>
 #include <QDBusMessage>
 #include <QDBusPendingCallWatcher>
 #include <QDBusPendingReply>
 #include <QDesktopServices>
-#include <QFileInfo>
 #include <QStringList>
-#include <QUrl>
 #include <QVariantMap>
 
 namespace movieconv::window {
@@ -37,6 +37,10 @@ void Call(const QDBusConnection& bus, const QDBusMessage& message, QObject* cont
 }
 
 } // namespace
+
+QUrl UrlOf(const std::string& path) {
+    return QUrl::fromEncoded("file://" + QByteArray::fromStdString(path).toPercentEncoding("/"));
+}
 
 void SleepGuard::Hold() {
     if (wanted_)
@@ -122,14 +126,18 @@ void Suspend() {
     QDBusConnection::systemBus().send(message);
 }
 
-void ShowInFolder(const QString& path) {
+void OpenFile(const std::string& path) {
+    QDesktopServices::openUrl(UrlOf(path));
+}
+
+void ShowInFolder(const std::string& path) {
     const QString manager = QStringLiteral("org.freedesktop.FileManager1");
     QDBusMessage message = QDBusMessage::createMethodCall(
         manager, QStringLiteral("/org/freedesktop/FileManager1"), manager, QStringLiteral("ShowItems"));
-    message << QStringList{QUrl::fromLocalFile(path).toString(QUrl::FullyEncoded)} << QString();
+    message << QStringList{UrlOf(path).toString(QUrl::FullyEncoded)} << QString();
     Call(QDBusConnection::sessionBus(), message, qApp, [path](const QDBusPendingCall& call) {
         if (const QDBusPendingReply<> reply = call; reply.isError())
-            QDesktopServices::openUrl(QUrl::fromLocalFile(QFileInfo(path).absolutePath()));
+            OpenFile(text::FolderOf(path));
     });
 }
 

@@ -7,6 +7,9 @@
 #include <QDBusVariant>
 #include <QObject>
 #include <QString>
+#include <QUrl>
+
+#include <string>
 
 namespace movieconv::window {
 
@@ -67,8 +70,14 @@ private Q_SLOTS:
 /// Puts the machine to sleep.
 void Suspend();
 
+/// The address of a file whose name may have any bytes.
+QUrl UrlOf(const std::string& path);
+
+/// Opens a file with what the desktop has for it.
+void OpenFile(const std::string& path);
+
 /// Opens the folder of a file with the file selected, or the folder alone where that is not understood.
-void ShowInFolder(const QString& path);
+void ShowInFolder(const std::string& path);
 
 } // namespace movieconv::window
 

@@ -70,9 +70,28 @@ Journal::~Journal() {
         changed_.notify_all();
     }
     thread_.join();
+    if (lock_ >= 0)
+        close(lock_);
+}
+
+/// Where nothing can be locked, nobody else can be told.
+bool Journal::IsOwn() {
+    if (!own_) {
+        lock_ = open((path_ + ".lock").c_str(), O_RDWR | O_CREAT | O_CLOEXEC, 0600);
+        struct flock whole {};
+        whole.l_type = F_WRLCK;
+        own_ = lock_ < 0 || fcntl(lock_, F_SETLK, &whole) == 0 || (errno != EACCES && errno != EAGAIN);
+    }
+    return *own_;
 }
 
 std::vector<Entry> Journal::Load(QString& complaint) {
+    if (!IsOwn()) {
+        complaint = QCoreApplication::translate(
+            "Journal",
+            "Another window has the saved queue. What is added here is lost when this one is closed.");
+        return {};
+    }
     QFile file(QFile::decodeName(path_.c_str()));
     if (!file.open(QIODevice::ReadOnly))
         return {};
@@ -93,6 +112,8 @@ std::vector<Entry> Journal::Load(QString& complaint) {
 }
 
 void Journal::Keep(std::vector<Entry> entries) {
+    if (!IsOwn())
+        return;
     const std::lock_guard lock(mutex_);
     next_ = std::move(entries);
     changed_.notify_all();

@@ -15,7 +15,8 @@
 namespace movieconv::window {
 
 /// One JSON file that is replaced as a whole: whoever reads it finds the queue as it was at some moment.
-/// Writing happens on a thread of its own, for a disk may take its time.
+/// Writing happens on a thread of its own, for a disk may take its time. It belongs to the program that loads
+/// it first, for as long as that runs: another one neither reads nor writes it.
 class Journal {
 public:
     using OnFailure = std::function<void(const QString& sentence)>;
@@ -28,7 +29,8 @@ public:
     ~Journal();
 
     /// The queue that was kept last; none when there is no file. A file that cannot be understood is set
-    /// aside under another name, and `complaint` tells so. Before the first Keep.
+    /// aside under another name, and `complaint` tells so, as well as that it belongs to another program.
+    /// Before the first Keep.
     std::vector<Entry> Load(QString& complaint);
 
     /// Writes the entries, soon. Returns at once; of several calls in a row only the last may be written.
@@ -41,11 +43,14 @@ public:
     static std::string UsualPath();
 
 private:
+    bool IsOwn();
     void Run();
     void WriteAndTell(const std::vector<Entry>& entries);
 
     const std::string path_;
     const OnFailure failed_;
+    std::optional<bool> own_; // nothing until it matters
+    int lock_ = -1;
     bool failing_ = false; // the thread's
     std::mutex mutex_;
     std::condition_variable changed_;

@@ -4,6 +4,7 @@
 #include "host/window/widgets/BurnChoice.h"
 #include "host/window/widgets/CropChoice.h"
 #include "host/window/widgets/FormParts.h"
+#include "host/window/widgets/Icons.h"
 #include "host/window/widgets/Look.h"
 #include "host/window/widgets/MoreSettings.h"
 #include "host/window/widgets/RangeChoice.h"
@@ -62,11 +63,16 @@ QLayout* EntryPage::MakeHead() {
     facts_ = MakeHint();
     unusable_ = MakeRemark(&BadColour);
     unusable_->setAccessibleName(tr("Why it cannot be converted"));
+    look_ = new QPushButton(IconOf(Sign::kAgain), tr("Look &again"));
+    look_->setAccessibleDescription(tr("Finds out whether the movie can be converted now"));
+    connect(look_, &QPushButton::clicked, this, [this] { Q_EMIT LookWanted(entry_.id); });
     auto* head = new QVBoxLayout;
     head->setSpacing(4);
     head->addWidget(title_);
     head->addWidget(facts_);
     head->addWidget(unusable_);
+    head->addSpacing(8);
+    head->addWidget(look_, 0, Qt::AlignLeft);
     return head;
 }
 
@@ -266,11 +272,12 @@ void EntryPage::ConnectTracks() {
 void EntryPage::Show(const Entry& entry) {
     entry_ = entry;
     filling_ = true;
-    SetTitle(*title_, NameOf(entry.source).simplified());
+    SetTitle(*title_, NameOf(entry.source));
     facts_->setText(entry.facts ? FactsLine(*entry.facts) : tr("Looking at it…"));
     facts_->setVisible(entry.facts || entry.unusable.isEmpty());
     unusable_->setText(entry.unusable);
     unusable_->setVisible(!entry.unusable.isEmpty());
+    look_->setVisible(!entry.unusable.isEmpty());
     body_->setVisible(entry.unusable.isEmpty());
     ShowWishes();
     target_->Show(entry);

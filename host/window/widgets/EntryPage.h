@@ -40,6 +40,7 @@ Q_SIGNALS:
     void AllWanted(const movieconv::window::Wishes& wishes);
     void SavingWanted(const movieconv::window::Wishes& wishes);
     void LoadingWanted(quint64 id);
+    void LookWanted(quint64 id);
 
 private:
     QLayout* MakeHead();
@@ -67,6 +68,7 @@ private:
     QLabel* title_;
     QLabel* facts_;
     QLabel* unusable_;
+    QPushButton* look_;
     QWidget* body_;
     QComboBox* preset_;
     QLabel* description_;

@@ -26,7 +26,7 @@ public:
 
 protected:
     void changeEvent(QEvent* event) override {
-        if (event->type() == QEvent::ApplicationPaletteChange)
+        if (event->type() == QEvent::PaletteChange)
             Colour();
         QLabel::changeEvent(event);
     }
@@ -36,11 +36,14 @@ protected:
     }
 
 private:
+    /// The one colour alone: of a palette whose colours are all its own, a label hears of no change.
     void Colour() {
-        QPalette changed = QApplication::palette();
-        changed.setColor(QPalette::WindowText, colour_(changed));
-        if (changed != palette())
-            setPalette(changed);
+        const QColor colour = colour_(palette());
+        if (colour == palette().color(QPalette::WindowText))
+            return;
+        QPalette own;
+        own.setColor(QPalette::WindowText, colour);
+        setPalette(own);
     }
 
     QColor (*const colour_)(const QPalette&);

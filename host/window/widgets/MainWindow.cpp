@@ -14,6 +14,7 @@
 #include <QDir>
 #include <QFileDialog>
 #include <QLabel>
+#include <QLineEdit>
 #include <QMimeData>
 #include <QProgressBar>
 #include <QPushButton>
@@ -80,6 +81,8 @@ MainWindow::MainWindow(Queue& queue, Dispatcher& dispatcher, Runner& runner, Set
     foot_ = MakeFoot();
     layout->addWidget(foot_);
     setCentralWidget(centre);
+    for (QLineEdit* field : findChildren<QLineEdit*>())
+        field->setAcceptDrops(false); // movies that are dropped on it are meant for the queue
     Connect();
     if (const QByteArray geometry = settings_.LoadGeometry(); !geometry.isEmpty())
         restoreGeometry(geometry);
@@ -120,6 +123,7 @@ void MainWindow::Connect() {
     connect(entryPage_, &EntryPage::AllWanted, &queue_, &Queue::SetWishesOfAll);
     connect(entryPage_, &EntryPage::SavingWanted, this, &MainWindow::SavePreset);
     connect(entryPage_, &EntryPage::LoadingWanted, this, &MainWindow::LoadPreset);
+    connect(entryPage_, &EntryPage::LookWanted, &queue_, &Queue::LookAgain);
 }
 
 void MainWindow::Tell(const QString& sentence) {
@@ -208,6 +212,8 @@ void MainWindow::LoadPreset(quint64 id) {
     connect(dialog, &QFileDialog::fileSelected, this, [this, id](const QString& path) {
         try {
             const PresetFacts preset = runner_.LoadPreset(path.toStdString());
+            for (const QString& complaint : preset.complaints)
+                Tell(complaint);
             entryPage_->FillPresets();
             queue_.FillPresets();
             Wishes wishes;
@@ -267,6 +273,8 @@ void MainWindow::ShowTotals() {
             parts += tr("%1 left for all").arg(LeftText(*totals.left));
         if (dispatcher_.StopsAfterThis())
             parts += tr("stops after this one");
+        if (closing_)
+            parts += tr("closes when done");
     } else if (totals.waiting > 0) {
         parts += tr("%n movies are ready", "", totals.waiting);
     }
@@ -333,7 +341,7 @@ void MainWindow::OnChanged(quint64 id) {
                 kFull,
                 tr("The disk with “%1” is full. Make room, and the conversion goes on by itself; or stop "
                    "it and keep what is done.")
-                    .arg(Readable(entry->target)));
+                    .arg(Shown(entry->target)));
         }
     } else if (notices_->Shows(kFull)) {
         const bool stillFull =
@@ -358,14 +366,18 @@ void MainWindow::OnEnded(quint64 id) {
 }
 
 void MainWindow::AskBeforeClosing() {
+    const auto close = [this](bool wanted) {
+        closing_ = wanted;
+        ShowTotals();
+    };
     notices_->Show(kClosing, tr("Movies are being converted. What is converted so far can be kept as it is."),
                    {{tr("Stop and close"),
-                     [this] {
-                         closing_ = true;
+                     [this, close] {
+                         close(true);
                          dispatcher_.StopAll();
                      }},
-                    {tr("Close when done"), [this] { closing_ = true; }},
-                    {tr("Go on"), [this] { closing_ = false; }}});
+                    {tr("Close when done"), [close] { close(true); }},
+                    {tr("Go on"), [close] { close(false); }}});
 }
 
 void MainWindow::closeEvent(QCloseEvent* event) {

@@ -38,8 +38,8 @@ public:
 Q_SIGNALS:
     /// The user wants the program to end, and nothing stands in the way.
     void Closed();
-    void FileWanted(const QString& path);
-    void FolderWanted(const QString& path);
+    void FileWanted(const std::string& path);
+    void FolderWanted(const std::string& path);
 
 protected:
     void closeEvent(QCloseEvent* event) override;

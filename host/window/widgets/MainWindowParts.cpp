@@ -82,13 +82,18 @@ void MainWindow::MakeQueueMenu() {
     menu->addSeparator();
     again_ = Add(menu, "again", tr("Convert &again"), tr("Ctrl+R"),
                  [this] { queue_.Retry(view_->SelectedIds()); });
-    play_ = Add(menu, "play", tr("&Play the converted movie"), tr("Ctrl+Shift+P"), [this] {
-        if (const Entry* entry = queue_.Find(view_->CurrentId()); entry && !entry->outcome.files.empty())
-            Q_EMIT FileWanted(Readable(entry->outcome.files.front()));
+    const auto currentFile = [this] {
+        const Entry* entry = queue_.Find(view_->CurrentId());
+        return entry != nullptr && !entry->outcome.files.empty() ? entry->outcome.files.front()
+                                                                 : std::string();
+    };
+    play_ = Add(menu, "play", tr("&Play the converted movie"), tr("Ctrl+Shift+P"), [this, currentFile] {
+        if (const std::string file = currentFile(); !file.empty())
+            Q_EMIT FileWanted(file);
     });
-    folder_ = Add(menu, "folder", tr("Show in &folder"), tr("Ctrl+Shift+F"), [this] {
-        if (const Entry* entry = queue_.Find(view_->CurrentId()); entry && !entry->outcome.files.empty())
-            Q_EMIT FolderWanted(Readable(entry->outcome.files.front()));
+    folder_ = Add(menu, "folder", tr("Show in &folder"), tr("Ctrl+Shift+F"), [this, currentFile] {
+        if (const std::string file = currentFile(); !file.empty())
+            Q_EMIT FolderWanted(file);
     });
     menu->addSeparator();
     remove_ = Add(menu, "remove", tr("&Remove"), QKeySequence::Delete,

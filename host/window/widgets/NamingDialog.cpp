@@ -34,6 +34,7 @@ NamingDialog::NamingDialog(const Naming& naming, QWidget* parent)
     auto* label = new QLabel(tr("&Name"));
     label->setBuddy(pattern_);
     auto* row = new QHBoxLayout;
+    row->setSpacing(10);
     row->addWidget(folder_, 1);
     row->addWidget(browse);
     auto* form = new QFormLayout(this);

@@ -28,22 +28,6 @@ QColor ColourOf(State state, const QPalette& palette) {
                                      : WarningColour(palette);
 }
 
-QPixmap SignPicture(State state, const QPalette& palette, qreal ratio) {
-    QPixmap pixmap(QSize(kOutcomeSignSize, kOutcomeSignSize) * ratio);
-    pixmap.setDevicePixelRatio(ratio);
-    pixmap.fill(Qt::transparent);
-    QPainter painter(&pixmap);
-    painter.setRenderHint(QPainter::Antialiasing);
-    QColor ground = ColourOf(state, palette);
-    ground.setAlpha(38);
-    painter.setPen(Qt::NoPen);
-    painter.setBrush(ground);
-    painter.drawEllipse(0, 0, kOutcomeSignSize, kOutcomeSignSize);
-    PaintSign(painter, OutcomeSignOf(state), QRectF(12, 12, kOutcomeSignSize - 24, kOutcomeSignSize - 24),
-              ColourOf(state, palette));
-    return pixmap;
-}
-
 QString TitleOf(State state) {
     return state == State::kDone      ? OverPage::tr("Done")
            : state == State::kStopped ? OverPage::tr("Stopped")
@@ -68,9 +52,35 @@ QString FactsOf(const Entry& entry) {
 
 } // namespace
 
+/// Drawn anew with every change of the window's colours.
+class OutcomeSign : public QWidget {
+public:
+    OutcomeSign() { setFixedSize(kOutcomeSignSize, kOutcomeSignSize); }
+    void Show(State state) {
+        state_ = state;
+        update();
+    }
+
+protected:
+    void paintEvent(QPaintEvent*) override {
+        QPainter painter(this);
+        painter.setRenderHint(QPainter::Antialiasing);
+        QColor ground = ColourOf(state_, palette());
+        ground.setAlpha(38);
+        painter.setPen(Qt::NoPen);
+        painter.setBrush(ground);
+        painter.drawEllipse(rect());
+        PaintSign(painter, OutcomeSignOf(state_), QRectF(rect()).adjusted(12, 12, -12, -12),
+                  ColourOf(state_, palette()));
+    }
+
+private:
+    State state_ = State::kDone;
+};
+
 OverPage::OverPage(QWidget* parent)
     : QWidget(parent),
-      sign_(new QLabel),
+      sign_(new OutcomeSign),
       title_(MakeTitle({}, 1.5, true)),
       sentence_(new QLabel),
       facts_(MakeHint()),
@@ -113,15 +123,15 @@ OverPage::OverPage(QWidget* parent)
 
 void OverPage::Show(const Entry& entry) {
     shown_ = entry.id;
-    sign_->setPixmap(SignPicture(entry.state, palette(), devicePixelRatioF()));
-    SetTitle(*title_, QStringLiteral("%1 – %2").arg(NameOf(entry.source).simplified(), TitleOf(entry.state)));
+    sign_->Show(entry.state);
+    SetTitle(*title_, QStringLiteral("%1 – %2").arg(NameOf(entry.source), TitleOf(entry.state)));
     const bool hasFile = !entry.outcome.files.empty();
-    file_ = hasFile ? Readable(entry.outcome.files.front()) : QString();
+    file_ = hasFile ? entry.outcome.files.front() : std::string();
     QString sentence = entry.outcome.sentence;
     if (entry.state == State::kInterrupted)
         sentence = tr("The program ended while this movie was being converted. Convert it again?");
     else if (sentence.isEmpty() && hasFile)
-        sentence = tr("The movie is in “%1”.").arg(file_);
+        sentence = tr("The movie is in “%1”.").arg(Shown(file_));
     sentence_->setText(sentence);
     facts_->setText(FactsOf(entry));
     facts_->setVisible(!facts_->text().isEmpty());

@@ -12,6 +12,7 @@ class QPushButton;
 namespace movieconv::window {
 
 class LogPanel;
+class OutcomeSign;
 
 class OverPage : public QWidget {
     Q_OBJECT
@@ -22,13 +23,13 @@ public:
 
 Q_SIGNALS:
     void AgainWanted(quint64 id);
-    void FileWanted(const QString& path);
-    void FolderWanted(const QString& path);
+    void FileWanted(const std::string& path);
+    void FolderWanted(const std::string& path);
 
 private:
     quint64 shown_ = 0;
-    QString file_;
-    QLabel* sign_;
+    std::string file_;
+    OutcomeSign* sign_;
     QLabel* title_;
     QLabel* sentence_;
     QLabel* facts_;

@@ -137,7 +137,7 @@ void WorkPage::Show(const Entry& entry) {
     if (entry.id != shown_) {
         shown_ = entry.id;
         picture_->Show({});
-        SetTitle(*title_, NameOf(entry.source).simplified());
+        SetTitle(*title_, NameOf(entry.source));
     }
     const Figures& figures = entry.figures;
     paused_ = figures.phase == Phase::kPaused;
