@@ -65,12 +65,27 @@ void ScriptedRunner::Script::End(Ending ending, const QString& sentence) {
 }
 
 std::vector<PresetFacts> ScriptedRunner::Presets() {
-    return {{QStringLiteral("kept"), QStringLiteral("Kept"), QStringLiteral("Leaves the sound as it is."),
-             QStringLiteral("mkv"), 60, true, {}},
-            {QStringLiteral("standard"), QStringLiteral("Standard"), QStringLiteral("Plays everywhere."),
-             QStringLiteral("mp4"), 60, false, {}},
-            {QStringLiteral("web"), QStringLiteral("Web"), QStringLiteral("For web pages."),
-             QStringLiteral("webm"), 50, false, {}}};
+    return {{QStringLiteral("kept"),
+             QStringLiteral("Kept"),
+             QStringLiteral("Leaves the sound as it is."),
+             QStringLiteral("mkv"),
+             60,
+             true,
+             {}},
+            {QStringLiteral("standard"),
+             QStringLiteral("Standard"),
+             QStringLiteral("Plays everywhere."),
+             QStringLiteral("mp4"),
+             60,
+             false,
+             {}},
+            {QStringLiteral("web"),
+             QStringLiteral("Web"),
+             QStringLiteral("For web pages."),
+             QStringLiteral("webm"),
+             50,
+             false,
+             {}}};
 }
 
 std::vector<FormatFacts> ScriptedRunner::Formats() {

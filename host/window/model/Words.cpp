@@ -4,8 +4,8 @@
 
 #include <QCoreApplication>
 #include <QLocale>
-#include <QTextDocument>
 #include <QStringList>
+#include <QTextDocument>
 
 #include <algorithm>
 #include <cmath>
