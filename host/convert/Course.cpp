@@ -64,8 +64,10 @@ Course::Course(const Request& request, Movie& movie, Wishes& wishes, Observer& o
       files_(observer, request.firstClip ? request.firstClip->number : 0),
       engine_(MakeEngine(request_, movie.Info(), clips_.Pictures(), clips_.Sound(), watch_.OptionSet())),
       clock_(WorkClock::Now()) {
-    if (request.firstClip)
+    if (request.firstClip) {
         clips_.BeginAt(request.firstClip->begin);
+        earlier_ = clips_.Offset();
+    }
     if (request.piece && request.piece->pictures)
         movie.EndPicturesAt(ToSeconds(request.piece->until));
     else if (request.length)
@@ -354,6 +356,7 @@ Verdict Course::Conclude() {
                       : userStopped_ && outcome_ == kOutcomeStopped ? Outcome::kStopped
                                                                     : Outcome::kDone;
     verdict.position = Converted(Position());
+    verdict.earlier = earlier_;
     verdict.worked = clock_.Seconds();
     verdict.bytes = files_.Bytes();
     verdict.files = files_.Complete();

@@ -87,6 +87,7 @@ private:
     FileLedger files_;
     Engine engine_;
     std::vector<Carried::Subtitles> subtitles_; // that are in the output
+    double earlier_ = 0;                        // seconds, in the clips that are there
 
     // The engine's worker sets these.
     std::atomic<double> position_{0}; // in the clip, in seconds

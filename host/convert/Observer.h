@@ -105,6 +105,7 @@ struct Verdict {
     Outcome outcome = Outcome::kFailed;
     std::optional<Failure> failure; ///< Of a failed one.
     double position = 0;            ///< Seconds of the source converted.
+    double earlier = 0;             ///< How much of that an earlier run had done.
     double worked = 0;              ///< Seconds, pauses left out.
     int64_t bytes = 0;              ///< Of the complete files.
     int files = 0;                  ///< Complete ones.

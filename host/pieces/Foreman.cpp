@@ -133,6 +133,7 @@ Verdict Foreman::Perform() {
     if (Stopped() && verdict_.outcome == Outcome::kDone)
         verdict_.outcome = Outcome::kStopped;
     verdict_.position = done_;
+    verdict_.earlier = earlier_;
     verdict_.worked = Worked();
     verdict_.bytes = bytes_;
     if (verdict_.outcome == Outcome::kDone && order_.join)
@@ -210,8 +211,11 @@ void Foreman::Announce() {
         if (std::find(missing_.begin(), missing_.end(), number) == missing_.end())
             done_ += length;
     }
-    if (order_.only && plan_.IsRest(*order_.only)) // its progress is the sound's
+    if (order_.only && plan_.IsRest(*order_.only)) { // its progress is the sound's
         length_ = ToSeconds(plan_.pictures.back().end - plan_.pictures.front().begin);
+        done_ = missing_.empty() ? length_ : 0;
+    }
+    earlier_ = done_;
     News().Started({plan_.source.path, order_.only ? PiecePath(order_.planPath, *order_.only) : plan_.output,
                     length_, true});
     if (order_.only && missing_.empty())
@@ -311,6 +315,7 @@ void Foreman::JoinAll() {
         return !Stopped();
     });
     TickClock();
+    joined.earlier = earlier_;
     joined.worked = Worked();
     if (Stopped() && joined.outcome != Outcome::kDone) {
         joined.outcome = Outcome::kStopped;

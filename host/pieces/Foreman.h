@@ -67,8 +67,9 @@ private:
     std::deque<int> missing_; // pieces that are to be begun
     std::set<int> fromStart_; // of these, those for which the source is read from its start
     Verdict verdict_;
-    double length_ = 0; // seconds of all pictures to be converted
-    double done_ = 0;   // of the pieces that are made
+    double length_ = 0;  // seconds of all pictures to be converted
+    double done_ = 0;    // of the pieces that are made
+    double earlier_ = 0; // of those that were made before
     int64_t bytes_ = 0;
 };
 

@@ -4,7 +4,6 @@
 #include "host/terminal/JsonReporter.h"
 #include "host/terminal/TextReporter.h"
 
-#include <algorithm>
 #include <cstdlib>
 #include <fmt/format.h>
 #include <string_view>
@@ -17,6 +16,12 @@ bool WantsColour() {
     const char* terminal = std::getenv("TERM");
     return (forbidden == nullptr || *forbidden == '\0') && terminal != nullptr &&
            std::string_view(terminal) != "dumb";
+}
+
+/// " (1.25x)"; empty where this run has converted nothing, as when it only joined pieces.
+std::string SpeedOf(const Verdict& verdict) {
+    const double converted = verdict.position - verdict.earlier;
+    return converted > 0 && verdict.worked > 0 ? fmt::format(" ({:.2f}x)", converted / verdict.worked) : "";
 }
 
 } // namespace
@@ -34,11 +39,10 @@ void Reporter::Ended(const Verdict& verdict) {
     } else {
         const bool done = verdict.outcome == Outcome::kDone;
         end.outcome = done ? "done" : "stopped";
-        end.summary =
-            fmt::format("{}: {} converted in {} ({:.2f}x), {} in {}", done ? "100% done" : "stopped",
-                        FormatTime(end.position, true), FormatTime(end.worked, true),
-                        end.position / std::max(end.worked, 1e-3), FormatBytes(end.bytes),
-                        end.files == 1 ? "one file" : fmt::format("{} files", end.files));
+        end.summary = fmt::format("{}: {} converted in {}{}, {} in {}", done ? "100% done" : "stopped",
+                                  FormatTime(end.position, true), FormatTime(end.worked, true),
+                                  SpeedOf(verdict), FormatBytes(end.bytes),
+                                  end.files == 1 ? "one file" : fmt::format("{} files", end.files));
     }
     End(end);
 }
