@@ -14,6 +14,8 @@
 #include <dirent.h>
 #include <fmt/format.h>
 #include <memory>
+#include <optional>
+#include <set>
 #include <string_view>
 #include <sys/stat.h>
 #include <unistd.h>
@@ -68,13 +70,25 @@ void CheckFolder(const std::string& folder) {
     }
 }
 
-/// Whether `name` is that of one of the clips of `output`.
-bool IsClipName(std::string_view name, std::string_view output) {
+/// The number of the clip of `output` that has this name; nothing when none has it.
+std::optional<std::size_t> ClipNumber(std::string_view name, std::string_view output) {
     const auto [base, extension] = text::SplitName(output);
     std::size_t number = 0;
     const char* digits = name.data() + std::min(base.size() + 1, name.size());
-    return std::from_chars(digits, name.data() + name.size(), number).ec == std::errc() &&
-           name == text::ClipName(output, number);
+    const bool isClip = std::from_chars(digits, name.data() + name.size(), number).ec == std::errc() &&
+                        name == text::ClipName(output, number);
+    return isClip ? std::optional(number) : std::nullopt;
+}
+
+/// The numbers of the clips of the output `name` that are in its folder. A folder that cannot be listed holds
+/// none as far as one can tell.
+std::set<std::size_t> ClipsIn(const std::string& folder, const std::string& name) {
+    std::set<std::size_t> numbers;
+    const std::unique_ptr<DIR, int (*)(DIR*)> listing(opendir(folder.c_str()), closedir);
+    while (const dirent* entry = listing ? readdir(listing.get()) : nullptr)
+        if (const std::optional<std::size_t> number = ClipNumber(entry->d_name, name))
+            numbers.insert(*number);
+    return numbers;
 }
 
 /// The last clip's number; of a source of unknown length as if it lasted a day.
@@ -100,10 +114,8 @@ void CheckClips(const Request& request, const struct stat* input) {
     }
     const std::string folder = text::FolderOf(request.output);
     CheckName(folder + "/" + text::ClipName(std::string_view(name), LastClip(request)));
-    const std::unique_ptr<DIR, int (*)(DIR*)> listing(opendir(folder.c_str()), closedir);
-    while (const dirent* entry = listing ? readdir(listing.get()) : nullptr)
-        if (IsClipName(entry->d_name, name))
-            CheckTarget(folder + "/" + entry->d_name, input, request);
+    for (const std::size_t number : ClipsIn(folder, name)) // the first one is what a refusal names
+        CheckTarget(folder + "/" + text::ClipName(std::string_view(name), number), input, request);
 }
 
 } // namespace
@@ -123,7 +135,7 @@ bool IsOutput(const std::string& path, const Request& request) {
     if (name.size() > text::kPartialSuffix.size() && name.ends_with(text::kPartialSuffix))
         name.resize(name.size() - text::kPartialSuffix.size());
     const std::string output = text::NameOf(request.output);
-    return name == output || (request.split && IsClipName(name, output));
+    return name == output || (request.split && ClipNumber(name, output));
 }
 
 void CheckName(const std::string& path, const std::string& suffix) {

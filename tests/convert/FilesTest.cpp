@@ -8,7 +8,7 @@
 #include "tests/convert/Wanted.h"
 #include "tests/support/Folder.h"
 #include "tests/writer/TestSource.h"
-#include "text/Utf8.h"
+#include "text/FileNames.h"
 
 #include <gtest/gtest.h>
 
@@ -75,6 +75,21 @@ TEST(OutputCheck, RefusesWhatWouldBeLost) {
         EXPECT_THROW(CheckOutput(itself), Failure);
     }
     EXPECT_EQ(ReadFile(folder / "there.mp4"), "precious");
+}
+
+TEST(OutputCheck, NamesTheFirstOfTheClipsThatAreThere) {
+    const Folder folder;
+    for (int number = 40; number > 2; --number) // a folder lists them in an order of its own
+        WriteFile(folder / text::ClipName(std::string_view("c.mp4"), static_cast<std::size_t>(number)),
+                  "precious");
+    Request request = To(folder / "c.mp4");
+    request.split = 2;
+    try {
+        CheckOutput(request);
+        ADD_FAILURE() << "not refused";
+    } catch (const Failure& failure) {
+        EXPECT_NE(failure.Text().find("c_03.mp4"), std::string::npos) << failure.Text();
+    }
 }
 
 TEST(OutputCheck, KnowsTheNamesOfAnOutput) {
