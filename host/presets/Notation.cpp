@@ -11,7 +11,28 @@ namespace {
 
 constexpr double kMostSeconds = 1e9; // thirty years; keeps sums of 100 ns units far from their limit
 
-/// A plain non-negative decimal number, whatever the locale.
+bool IsDigits(std::string_view text) {
+    return !text.empty() &&
+           std::all_of(text.begin(), text.end(), [](char c) { return c >= '0' && c <= '9'; });
+}
+
+/// A number from 1 to `most`, perhaps with one of `prefixes` behind it, the first of which is a thousand,
+/// each further one a thousand times the one before.
+std::optional<double> ParseScaled(std::string_view text, std::string_view prefixes, double most) {
+    double factor = 1;
+    const char last = text.empty() ? ' ' : text.back() == 'K' ? 'k' : text.back();
+    if (const std::size_t place = prefixes.find(last); place != std::string_view::npos) {
+        factor = std::pow(1000.0, static_cast<double>(place + 1));
+        text.remove_suffix(1);
+    }
+    const auto number = ParseNumber(text);
+    if (!number || *number * factor < 1 || *number * factor > most)
+        return std::nullopt;
+    return *number * factor;
+}
+
+} // namespace
+
 std::optional<double> ParseNumber(std::string_view text) {
     double value = 0;
     const auto [end, error] =
@@ -22,12 +43,12 @@ std::optional<double> ParseNumber(std::string_view text) {
     return value;
 }
 
-bool IsDigits(std::string_view text) {
-    return !text.empty() &&
-           std::all_of(text.begin(), text.end(), [](char c) { return c >= '0' && c <= '9'; });
+std::optional<int> ParseWhole(std::string_view text, int least, int most) {
+    int value = 0;
+    const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), value);
+    const bool whole = error == std::errc() && end == text.data() + text.size();
+    return whole && value >= least && value <= most ? std::optional(value) : std::nullopt;
 }
-
-} // namespace
 
 std::optional<double> ParseTime(std::string_view text) {
     double whole = 0;
@@ -47,34 +68,14 @@ std::optional<double> ParseTime(std::string_view text) {
 }
 
 std::optional<int32_t> ParseRate(std::string_view text) {
-    double factor = 1;
-    if (!text.empty() && (text.back() == 'k' || text.back() == 'K'))
-        factor = 1e3;
-    else if (!text.empty() && text.back() == 'M')
-        factor = 1e6;
-    if (factor > 1)
-        text.remove_suffix(1);
-    const auto number = ParseNumber(text);
-    if (!number || *number * factor < 1 || *number * factor > INT32_MAX)
-        return std::nullopt;
-    return static_cast<int32_t>(std::lround(*number * factor));
+    const auto rate = ParseScaled(text, "kM", INT32_MAX);
+    return rate ? std::optional(static_cast<int32_t>(std::lround(*rate))) : std::nullopt;
 }
 
 std::optional<int64_t> ParseBytes(std::string_view text) {
     constexpr double kMost = 1e15;
-    double factor = 1;
-    if (!text.empty() && (text.back() == 'k' || text.back() == 'K'))
-        factor = 1e3;
-    else if (!text.empty() && text.back() == 'M')
-        factor = 1e6;
-    else if (!text.empty() && text.back() == 'G')
-        factor = 1e9;
-    if (factor > 1)
-        text.remove_suffix(1);
-    const auto number = ParseNumber(text);
-    if (!number || *number * factor < 1 || *number * factor > kMost)
-        return std::nullopt;
-    return std::llround(*number * factor);
+    const auto bytes = ParseScaled(text, "kMG", kMost);
+    return bytes ? std::optional<int64_t>(std::llround(*bytes)) : std::nullopt;
 }
 
 std::optional<Size> ParseSize(std::string_view text) {

@@ -11,6 +11,12 @@
 
 namespace movieconv {
 
+/// A decimal number from 0 on, as "23" or "23.5", whatever the locale. Nothing for anything else.
+std::optional<double> ParseNumber(std::string_view text);
+
+/// A whole number from `least` to `most`. Nothing for anything else.
+std::optional<int> ParseWhole(std::string_view text, int least, int most);
+
 /// Seconds from "83.5", "1:23.5" or "0:01:23.5". Nothing for anything else, negative times included.
 std::optional<double> ParseTime(std::string_view text);
 

@@ -6,7 +6,7 @@
 #include "media/Limits.h"
 
 #include <algorithm>
-#include <charconv>
+#include <climits>
 #include <fmt/format.h>
 #include <functional>
 #include <optional>
@@ -17,10 +17,7 @@ namespace {
 constexpr double kWorstQuality = 63; // of all scales
 
 std::optional<int> ParseBound(const std::string& text) {
-    int bound = 0;
-    const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), bound);
-    return error == std::errc() && end == text.data() + text.size() && bound >= 0 ? std::optional(bound)
-                                                                                  : std::nullopt;
+    return ParseWhole(text, 0, INT_MAX);
 }
 
 /// An object whose keys are all numbers.

@@ -3,6 +3,8 @@
 #ifndef MOVIECONV_HOST_TERMINAL_OPTIONGROUP_H
 #define MOVIECONV_HOST_TERMINAL_OPTIONGROUP_H
 
+#include "host/presets/Notation.h"
+
 #include <CLI/CLI.hpp>
 #include <fmt/format.h>
 #include <functional>
@@ -43,15 +45,6 @@ public:
         app_.add_option_function<Type>(names, take, help)->type_name(type)->group(heading_);
     }
 
-    /// A whole number from `least` to `most`.
-    void Number(const std::string& names, const std::string& type, std::optional<int>& target, int least,
-                int most, const std::string& help) {
-        app_.add_option(names, target, help)
-            ->check(CLI::Range(least, most).description(""))
-            ->type_name(type)
-            ->group(heading_);
-    }
-
     /// A text for `read`, which returns false where it is not `notation`: so the message calls that.
     void Read(const std::string& names, const std::string& type, std::function<bool(const std::string&)> read,
               const std::string& notation, const std::string& help) {
@@ -71,6 +64,23 @@ public:
             return value.has_value();
         };
         Read(names, type, read, notation, help);
+    }
+
+    /// A whole number from `least` to `most`, handed to `take`.
+    void Number(const std::string& names, const std::string& type, int least, int most,
+                const std::function<void(int)>& take, const std::string& help) {
+        const auto read = [=](const std::string& text) {
+            const std::optional<int> number = ParseWhole(text, least, most);
+            if (number)
+                take(*number);
+            return number.has_value();
+        };
+        Read(names, type, read, fmt::format("a whole number from {} to {}", least, most), help);
+    }
+    void Number(const std::string& names, const std::string& type, int least, int most,
+                std::optional<int>& target, const std::string& help) {
+        Number(
+            names, type, least, most, [&target](int number) { target = number; }, help);
     }
 
     /// One of some words, which are also what --help calls the value unless `type` says otherwise.

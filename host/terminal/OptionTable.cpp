@@ -79,8 +79,8 @@ void AddPictures(CLI::App& app, Options& options) {
     group.Parsed("--frame-rate", "N", ParseFrameRate, request.frameRate,
                  fmt::format("a frame rate up to {}, such as 25 or 30000/1001", kHighestFrameRate),
                  "Pictures per second; by default the source's");
-    group.Value("--quality", "N", request.quality,
-                "Constant quality on the codec's scale, less is better;\nby default the preset's");
+    group.Parsed("--quality", "N", ParseNumber, request.quality, "a number such as 23 or 23.5",
+                 "Constant quality on the codec's scale, less is better;\nby default the preset's");
     group.Parsed(
         "--max-size", "BYTES", ParseBytes, request.maxSize, "a size such as 700k, 25M or 4.7G",
         "The output's greatest size, as 25M: chooses rates, and\na smaller picture where they are low");
@@ -95,8 +95,8 @@ void AddPictures(CLI::App& app, Options& options) {
 void AddSound(CLI::App& app, Options& options) {
     OptionGroup group(app, "Sound");
     Request& request = options.request;
-    group.Number("--channels", "N", request.channels, 1, 8, "Channels; by default the source's");
-    group.Number("--sample-rate", "HZ", request.sampleRate, 4000, 384000,
+    group.Number("--channels", "N", 1, 8, request.channels, "Channels; by default the source's");
+    group.Number("--sample-rate", "HZ", 4000, 384000, request.sampleRate,
                  "Samples per second; by default the source's");
     AddRate(group, "--audio-rate", request.audioRate, "128k",
             "Bits per second, as 128k; by default the preset's");
@@ -117,7 +117,7 @@ void AddPieces(CLI::App& app, Options& options) {
     group.Parsed("--jobs", "N", ParseJobs, options.jobs,
                  fmt::format("a number from 1 to {}, or auto", kMostJobs),
                  "Convert in pieces, N at once; auto: as many as pay");
-    group.Number("--pieces", "N", options.division.pieces, 1, kMostPieces,
+    group.Number("--pieces", "N", 1, kMostPieces, options.division.pieces,
                  "Divide into N pieces; by default of a minute or more");
     group.Parsed("--piece-length", "TIME", ParseTime, options.division.length, kTime,
                  "Divide into pieces of this length");
@@ -129,8 +129,8 @@ void AddPieces(CLI::App& app, Options& options) {
             options.plan = name;
         },
         "Write a plan, by which pieces are made anywhere");
-    group.Taken<int>(
-        "--piece", "K",
+    group.Number(
+        "--piece", "K", 0, kMostPieces,
         [&options](int number) {
             options.task = Task::kPiece;
             options.piece = number;

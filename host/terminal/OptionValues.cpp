@@ -5,9 +5,7 @@
 
 #include <algorithm>
 #include <cctype>
-#include <charconv>
 #include <cstddef>
-#include <system_error>
 #include <utility>
 
 namespace movieconv {
@@ -18,12 +16,7 @@ std::optional<uint32_t> ParseFormat(std::string_view name) {
 }
 
 std::optional<int> ParseJobs(std::string_view text) {
-    if (text == "auto")
-        return 0;
-    int number = 0;
-    const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
-    const bool whole = error == std::errc() && end == text.data() + text.size();
-    return whole && number >= 1 && number <= kMostJobs ? std::optional(number) : std::nullopt;
+    return text == "auto" ? std::optional(0) : ParseWhole(text, 1, kMostJobs);
 }
 
 TrackList ParseTracks(const std::string& text) {
