@@ -33,6 +33,7 @@ struct Cover {
 struct Attachment {
     std::string fileName;
     std::string mimeType;
+    std::string description;
     Bytes data;
 };
 

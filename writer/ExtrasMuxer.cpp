@@ -95,7 +95,8 @@ void ExtrasMuxer::AddStreams(AVFormatContext& output) {
 }
 
 void ExtrasMuxer::AddAttachments(AVFormatContext& output) const {
-    const auto add = [&output](const std::string& name, const std::string& mimeType, const Bytes& data) {
+    const auto add = [&output](const std::string& name, const std::string& mimeType, const Bytes& data,
+                               const std::string& description = {}) {
         AVStream& made = NewStream(output);
         AVCodecParameters& parameters = *made.codecpar;
         parameters.codec_type = AVMEDIA_TYPE_ATTACHMENT;
@@ -103,13 +104,15 @@ void ExtrasMuxer::AddAttachments(AVFormatContext& output) const {
         std::copy(data->begin(), data->end(), parameters.extradata);
         parameters.extradata_size = static_cast<int>(data->size());
         SetTags(made.metadata, {{"filename", name}, {"mimetype", mimeType}});
+        if (!description.empty()) // or it would be there, and say nothing
+            SetTags(made.metadata, {{"title", description}});
     };
     if (extras_.cover.codec == AV_CODEC_ID_PNG)
         add("cover.png", "image/png", extras_.cover.data);
     else if (extras_.cover.codec == AV_CODEC_ID_MJPEG)
         add("cover.jpg", "image/jpeg", extras_.cover.data);
     for (const Attachment& attachment : extras_.attachments)
-        add(attachment.fileName, attachment.mimeType, attachment.data);
+        add(attachment.fileName, attachment.mimeType, attachment.data, attachment.description);
 }
 
 /// As a stream of one picture, for containers without attachments.

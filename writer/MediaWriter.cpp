@@ -288,7 +288,16 @@ int MWAddAttachment(uint32_t set, const char* fileName, const char* mimeType, co
             return false;
         const auto* bytes = static_cast<const uint8_t*>(data);
         extras.attachments.push_back(
-            {fileName, mimeType, std::make_shared<std::vector<uint8_t>>(bytes, bytes + size)});
+            {fileName, mimeType, {}, std::make_shared<std::vector<uint8_t>>(bytes, bytes + size)});
+        return true;
+    });
+}
+
+int MWDescribeAttachment(uint32_t set, const char* description) {
+    return ChangeExtras(set, [&](Extras& extras) {
+        if (extras.attachments.empty())
+            return false;
+        extras.attachments.back().description = description != nullptr ? description : "";
         return true;
     });
 }

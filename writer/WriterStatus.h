@@ -332,6 +332,9 @@ int MWSetCover(uint32_t set, const void* data, int64_t size);
 /// An attached file.
 int MWAddAttachment(uint32_t set, const char* fileName, const char* mimeType, const void* data, int64_t size);
 
+/// What the file attached last is, for people; null or an empty text takes that away. MKV holds it.
+int MWDescribeAttachment(uint32_t set, const char* description);
+
 /// Files of the set created so far, refused ones counted: the highest sequence number. 0 without such a set.
 int MWGetFileCount(uint32_t set);
 

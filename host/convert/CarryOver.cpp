@@ -176,7 +176,8 @@ bool CarryFile(const Movie& movie, const StreamInfo& stream, uint32_t set) {
     const auto size = static_cast<int64_t>(data.size());
     if (stream.kind == StreamKind::kCover)
         return MWSetCover(set, data.data(), size) != 0;
-    return MWAddAttachment(set, stream.fileName.c_str(), stream.mimeType.c_str(), data.data(), size) != 0;
+    return MWAddAttachment(set, stream.fileName.c_str(), stream.mimeType.c_str(), data.data(), size) != 0 &&
+           MWDescribeAttachment(set, stream.title.c_str()) != 0;
 }
 
 /// What is converted and what was chosen, of a source.
@@ -286,19 +287,24 @@ std::vector<int> StreamsBeside(const SourceInfo& source, const Chosen& chosen, c
     return beside;
 }
 
+/// What FFmpeg does not read of chapters, and so no output holds.
+void AddUnreadChapters(const SourceInfo& source, const Request& request, std::vector<NotCarried>& left) {
+    const auto add = [&](int count, const char* what) {
+        if (!request.noChapters && count > 0)
+            left.push_back({"chapters", std::nullopt, {}, {}, fmt::format("{} of them {}", count, what)});
+    };
+    add(source.unreadChapters, "are in other editions or within others");
+    add(source.furtherTitles, "have titles in further languages");
+}
+
 /// Texts, labels and chapters that the format has no room for.
 std::vector<NotCarried> LostByFormat(const SourceInfo& source, const std::vector<int>& beside,
                                      const Request& request, const FileFormatInfo& format) {
     std::vector<NotCarried> left = LostTexts(source, request, format);
     if (std::optional<NotCarried> chapters = WhyChaptersStay(source, request, format))
         left.push_back(*std::move(chapters));
-    else if (!request.noChapters && source.unreadChapters > 0)
-        left.push_back(
-            {"chapters",
-             std::nullopt,
-             {},
-             {},
-             fmt::format("{} of them are in other editions or within others", source.unreadChapters)});
+    else
+        AddUnreadChapters(source, request, left);
     if (std::optional<NotCarried> timecode = WhyTimecodeStays(source, request, format))
         left.push_back(*std::move(timecode));
     for (const int stream : beside)

@@ -1,5 +1,7 @@
 #include "host/source/Completeness.h"
 
+#include "host/source/ContainerParts.h"
+
 #include <algorithm>
 #include <array>
 #include <cstring>
@@ -25,21 +27,16 @@ bool Has(const Header& header, std::size_t at, std::string_view name) {
 
 /// MP4 and its like: boxes one behind another. Only those that hold a movie count, whatever follows them.
 bool BoxesAreCutOff(const InputFile& file) {
-    constexpr std::array<std::string_view, 3> kVital{"mdat", "moof", "moov"};
-    Header header{};
-    for (int64_t at = 0; file.ReadAt(at, header.data(), header.size()) >= 8;) {
-        int64_t size = AV_RB32(header.data());
-        const bool vital = std::any_of(kVital.begin(), kVital.end(),
-                                       [&](std::string_view name) { return Has(header, 4, name); });
-        if (size == 1)
-            size = static_cast<int64_t>(AV_RB64(header.data() + 8));
-        if (size < 8) // to the end of the file, or nothing that can be followed
+    constexpr std::array<uint32_t, 3> kVital{MKBETAG('m', 'd', 'a', 't'), MKBETAG('m', 'o', 'o', 'f'),
+                                             MKBETAG('m', 'o', 'o', 'v')};
+    for (int64_t at = 0;;) {
+        const std::optional<PartHead> box = ReadBoxHead(file, at);
+        if (!box || box->size == PartHead::kOpen)
             return false;
-        if (size > file.Size() - at)
-            return vital;
-        at += size;
+        if (box->size > file.Size() - at)
+            return std::find(kVital.begin(), kVital.end(), box->name) != kVital.end();
+        at += box->size;
     }
-    return false;
 }
 
 /// AVI and WAV: the first chunk tells its size, unless it was written where nobody could go back to enter it.
@@ -66,44 +63,18 @@ bool ObjectsAreCutOff(const InputFile& file) {
     return false;
 }
 
-/// An element's size or identifier in Matroska: the leading zeros of the first byte tell how long it is.
-struct Number {
-    int64_t value = 0;
-    int length = 0; // 0 when there is none
-    bool unknown = false;
-};
-Number ReadNumber(const uint8_t* data, bool withMarker) {
-    Number number;
-    while (number.length < 8 && (data[0] << number.length & 0x80) == 0)
-        ++number.length;
-    if (++number.length > 8)
-        return {};
-    uint64_t value = withMarker ? data[0] : data[0] & (0xFF >> number.length);
-    for (int i = 1; i < number.length; ++i)
-        value = value << 8 | data[i];
-    number.unknown = value == (uint64_t{1} << 7 * number.length) - 1;
-    number.value = static_cast<int64_t>(value);
-    return number;
-}
-
 /// Matroska and WebM: a head, and behind it one segment that holds all.
 bool SegmentIsCutOff(const InputFile& file) {
-    constexpr int64_t kSegment = 0x18538067;
+    constexpr uint64_t kSegment = 0x18538067;
     constexpr int kElements = 3; // the head, and a filler perhaps
     int64_t at = 0;
     for (int i = 0; i < kElements; ++i) {
-        Header header{};
-        if (file.ReadAt(at, header.data(), header.size()) < static_cast<int>(header.size()))
+        const std::optional<PartHead> element = ReadElementHead(file, at);
+        if (!element || element->size == PartHead::kOpen)
             return false;
-        const Number name = ReadNumber(header.data(), true);
-        const Number size =
-            name.length > 0 && name.length <= 4 ? ReadNumber(&header[name.length], false) : Number{};
-        if (size.length == 0 || size.unknown)
-            return false;
-        at += name.length + size.length;
-        if (name.value == kSegment || size.value > file.Size() - at)
-            return size.value > file.Size() - at;
-        at += size.value;
+        if (element->name == kSegment || element->size > file.Size() - at)
+            return element->size > file.Size() - at;
+        at += element->size;
     }
     return false;
 }

@@ -4,24 +4,37 @@
 
 #include "ffmpeg/AvHandles.h"
 #include "host/source/InputFile.h"
+#include "host/source/TrackWishes.h"
 
 #include <string>
 #include <vector>
 
 namespace movieconv {
 
-/// Texts are empty where the container tells none.
+/// Texts are empty where the container tells none, and in whatever character set it has them.
 struct ContainerNotes {
     struct Stream {
         std::string languageTag; ///< By BCP 47, "pt-BR".
         std::string title;       ///< Of the family of MP4.
     };
+    struct File {
+        std::string name;
+        std::string description;
+    };
     std::vector<Stream> streams; ///< For each stream of FFmpeg's.
-    std::string title;           ///< Of Matroska, where a tag of that name hides it.
-    int chapters = 0;            ///< All there are in Matroska, of every edition and within each other.
+
+    // Of Matroska:
+    std::string title;         ///< Where a tag of that name hides it.
+    std::vector<Tag> repeated; ///< Texts that are there several times: all of them, ";" in between.
+    std::vector<File> files;   ///< Attached ones that are described.
+    int chapters = 0;          ///< All there are, of every edition and within each other.
+    int furtherTitles = 0;     ///< Chapters that have more titles than one, in several languages.
 };
 
 ContainerNotes ReadContainerNotes(const InputFile& file, const AVFormatContext& context);
+
+/// What ReadContainerNotes gives of Matroska and WebM, with the tracks as streams.
+ContainerNotes ReadMatroskaNotes(const InputFile& file);
 
 } // namespace movieconv
 

@@ -76,6 +76,13 @@ std::string ThreeLetters(std::string_view code) {
     return language != nullptr ? std::string(language->three) : small;
 }
 
+std::string LanguageTagFrom(const std::string& text) {
+    const bool isTag = std::all_of(text.begin(), text.end(), [](unsigned char letter) {
+        return letter == '-' || (letter < 0x80 && std::isalnum(letter) != 0);
+    });
+    return isTag && text != "und" ? text : std::string();
+}
+
 std::string LanguageName(std::string_view code) {
     const Language* language = Find(ThreeLetters(code));
     return std::string(language != nullptr ? language->name : code);

@@ -12,6 +12,9 @@ namespace movieconv {
 /// or three letters, of which a region may follow behind a dash; other texts in small letters as they are.
 std::string ThreeLetters(std::string_view code);
 
+/// A language tag of BCP 47 as it stands in a file, "pt-BR"; empty for what is none, or says nothing.
+std::string LanguageTagFrom(const std::string& text);
+
 /// The English name of the language, "French"; of one that is not known the code as it is.
 std::string LanguageName(std::string_view code);
 

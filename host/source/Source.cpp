@@ -26,6 +26,27 @@ std::string NothingToConvert(const std::string& path, const SourceChoice& choice
                                                        : "sound");
 }
 
+/// Puts the text in the place of that of the same name, where there is one.
+void ReplaceTag(std::vector<Tag>& tags, const std::string& key, const std::string& text) {
+    const auto known = std::find_if(tags.begin(), tags.end(), [&](const Tag& tag) {
+        return av_strcasecmp(tag.key.c_str(), key.c_str()) == 0;
+    });
+    if (known != tags.end() && !text.empty())
+        known->value = ToUtf8(text, "");
+}
+
+/// Gives attached files what is said of them, each to the first one of its name that has nothing yet.
+void DescribeFiles(const std::vector<ContainerNotes::File>& files, std::vector<StreamInfo>& streams) {
+    for (const ContainerNotes::File& file : files) {
+        const auto stream = std::find_if(streams.begin(), streams.end(), [&](const StreamInfo& each) {
+            return each.kind == StreamKind::kAttachment && each.title.empty() &&
+                   each.fileName == ToUtf8(file.name, "");
+        });
+        if (stream != streams.end())
+            stream->title = ToUtf8(file.description, "");
+    }
+}
+
 /// Where the container tells more than FFmpeg reads.
 void TakeNotes(const ContainerNotes& notes, SourceInfo& info) {
     for (std::size_t i = 0; i < info.streams.size(); ++i) {
@@ -39,11 +60,11 @@ void TakeNotes(const ContainerNotes& notes, SourceInfo& info) {
         if (stream.title.empty())
             stream.title = ToUtf8(notes.streams[i].title, "");
     }
-    const auto title = std::find_if(info.tags.begin(), info.tags.end(), [](const Tag& tag) {
-        return av_strcasecmp(tag.key.c_str(), "title") == 0;
-    });
-    if (!notes.title.empty() && title != info.tags.end())
-        title->value = ToUtf8(notes.title, "");
+    for (const Tag& tag : notes.repeated)
+        ReplaceTag(info.tags, tag.key, tag.value);
+    ReplaceTag(info.tags, "title", notes.title);
+    DescribeFiles(notes.files, info.streams);
+    info.furtherTitles = notes.furtherTitles;
     info.unreadChapters = std::max(notes.chapters - static_cast<int>(info.chapters.size()), 0);
 }
 

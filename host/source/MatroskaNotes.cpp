@@ -1,0 +1,177 @@
+#include "host/source/ContainerNotes.h"
+
+#include "host/source/ContainerParts.h"
+#include "host/source/Languages.h"
+
+#include <algorithm>
+#include <array>
+#include <cstdint>
+#include <map>
+#include <set>
+#include <utility>
+
+namespace movieconv {
+namespace {
+
+constexpr uint64_t kSegment = 0x18538067;
+constexpr uint64_t kSeekHead = 0x114D9B74;
+constexpr uint64_t kSeek = 0x4DBB;
+constexpr uint64_t kSeekId = 0x53AB;
+constexpr uint64_t kSeekPosition = 0x53AC;
+constexpr uint64_t kCluster = 0x1F43B675;
+constexpr uint64_t kInfo = 0x1549A966;
+constexpr uint64_t kTitle = 0x7BA9;
+constexpr uint64_t kTracks = 0x1654AE6B;
+constexpr uint64_t kTrack = 0xAE;
+constexpr uint64_t kTrackType = 0x83;
+constexpr uint64_t kTrackLanguage = 0x22B59D;
+constexpr uint64_t kChapters = 0x1043A770;
+constexpr uint64_t kEdition = 0x45B9;
+constexpr uint64_t kChapter = 0xB6;
+constexpr uint64_t kChapterDisplay = 0x80;
+constexpr uint64_t kChapterTitle = 0x85;
+constexpr uint64_t kAttachments = 0x1941A469;
+constexpr uint64_t kFile = 0x61A7;
+constexpr uint64_t kFileName = 0x466E;
+constexpr uint64_t kFileDescription = 0x467E;
+constexpr uint64_t kTags = 0x1254C367;
+constexpr uint64_t kTag = 0x7373;
+constexpr uint64_t kTargets = 0x63C0;
+constexpr uint64_t kTargetType = 0x63CA;
+constexpr std::array<uint64_t, 4> kTargetsWithin{0x63C5, 0x63C9, 0x63C4, 0x63C6}; // of the movie
+constexpr uint64_t kSimpleTag = 0x67C8;
+constexpr uint64_t kTagName = 0x45A3;
+constexpr uint64_t kTagText = 0x4487;
+constexpr uint64_t kTagLanguage = 0x447A;
+
+constexpr int64_t kLongestLanguage = 36; // with its end
+constexpr int64_t kLongestName = 4096;   // also of titles
+constexpr int64_t kLongestText = 1 << 20;
+
+/// What one file tells.
+class MatroskaReader {
+public:
+    explicit MatroskaReader(const InputFile& file)
+        : elements_(file, ReadElementHead), segment_(elements_.Find(elements_.Whole(), kSegment)) {}
+
+    ContainerNotes Read() {
+        notes_.title = Text(Locate(kInfo), kTitle, kLongestName);
+        ReadTracks();
+        ForEach(Locate(kChapters), kEdition, [this](const Part& edition) { ReadChapters(edition, 0); });
+        ForEach(Locate(kAttachments), kFile, [this](const Part& file) {
+            if (std::string description = Text(file, kFileDescription, kLongestText); !description.empty())
+                notes_.files.push_back({Text(file, kFileName, kLongestName), std::move(description)});
+        });
+        ReadTags();
+        return std::move(notes_);
+    }
+
+private:
+    /// Calls `take` with those parts of `whole` that have that name.
+    template <class Take>
+    void ForEach(const Part& whole, uint64_t name, Take take) {
+        elements_.ForEach(whole, [&](const Part& part) {
+            if (part.name == name)
+                take(part);
+            return true;
+        });
+    }
+
+    std::string Text(const Part& whole, uint64_t name, int64_t most) {
+        return elements_.Text(elements_.Find(whole, name), 0, most);
+    }
+
+    /// A part of the segment: in front of the packets, or where the list of parts has it.
+    Part Locate(uint64_t name) {
+        if (const Part found = elements_.Find(segment_, name, kCluster); found.name == name)
+            return found;
+        Part located;
+        ForEach(elements_.Find(segment_, kSeekHead, kCluster), kSeek, [&](const Part& seek) {
+            const uint64_t place = elements_.Number(elements_.Find(seek, kSeekPosition));
+            if (elements_.Number(elements_.Find(seek, kSeekId)) != name ||
+                place >= static_cast<uint64_t>(segment_.end - segment_.begin))
+                return;
+            const Part part = elements_.At(segment_.begin + static_cast<int64_t>(place), segment_.end);
+            if (part.name == name)
+                located = part;
+        });
+        return located;
+    }
+
+    void ReadTracks() {
+        constexpr std::array<uint64_t, 4> kTypes{1, 2, 0x11, 0x21}; // of those that become streams
+        ForEach(Locate(kTracks), kTrack, [&](const Part& track) {
+            const uint64_t type = elements_.Number(elements_.Find(track, kTrackType));
+            if (std::find(kTypes.begin(), kTypes.end(), type) != kTypes.end())
+                notes_.streams.push_back(
+                    {LanguageTagFrom(Text(track, kTrackLanguage, kLongestLanguage)), {}});
+        });
+    }
+
+    /// Those in `whole`, an edition or a chapter.
+    void ReadChapters(const Part& whole, int depth) {
+        constexpr int kDeepest = 8;
+        if (depth == kDeepest)
+            return;
+        ForEach(whole, kChapter, [&](const Part& chapter) {
+            ++notes_.chapters;
+            notes_.furtherTitles += depth == 0 && HasSeveralTitles(chapter) ? 1 : 0;
+            ReadChapters(chapter, depth + 1);
+        });
+    }
+
+    bool HasSeveralTitles(const Part& chapter) {
+        std::set<std::string> titles;
+        ForEach(chapter, kChapterDisplay,
+                [&](const Part& display) { titles.insert(Text(display, kChapterTitle, kLongestName)); });
+        return titles.size() > 1;
+    }
+
+    /// Of the texts about the movie, those that come again under a key that FFmpeg has for one of them.
+    void ReadTags() {
+        std::map<std::string, std::vector<std::string>> texts;
+        ForEach(Locate(kTags), kTag, [&](const Part& tag) {
+            const Part targets = elements_.Find(tag, kTargets);
+            const bool isOfAPart =
+                std::any_of(kTargetsWithin.begin(), kTargetsWithin.end(), [&](uint64_t target) {
+                    return elements_.Number(elements_.Find(targets, target)) != 0;
+                });
+            const std::string type = Text(targets, kTargetType, kLongestName);
+            if (!isOfAPart)
+                ForEach(tag, kSimpleTag, [&](const Part& simple) {
+                    std::vector<std::string>& known = texts[KeyOf(simple, type)];
+                    std::string text = Text(simple, kTagText, kLongestText);
+                    if (!text.empty() && std::find(known.begin(), known.end(), text) == known.end())
+                        known.push_back(std::move(text));
+                });
+        });
+        for (const auto& [key, all] : texts) {
+            if (all.size() < 2)
+                continue;
+            Tag tag{key, all.front()};
+            for (std::size_t i = 1; i < all.size(); ++i)
+                tag.value += ";" + all[i]; // as FFmpeg joins Vorbis comments
+            notes_.repeated.push_back(std::move(tag));
+        }
+    }
+
+    /// "ARTIST", "ALBUM/ARTIST" where the tag tells what it is about, "ARTIST-fre" where it has a language.
+    std::string KeyOf(const Part& simple, const std::string& type) {
+        const std::string name = Text(simple, kTagName, kLongestName);
+        const std::string language = Text(simple, kTagLanguage, kLongestLanguage);
+        return (type.empty() ? name : type + "/" + name) +
+               (language.empty() || language == "und" ? "" : "-" + language);
+    }
+
+    Parts elements_;
+    const Part segment_;
+    ContainerNotes notes_;
+};
+
+} // namespace
+
+ContainerNotes ReadMatroskaNotes(const InputFile& file) {
+    return MatroskaReader(file).Read();
+}
+
+} // namespace movieconv
