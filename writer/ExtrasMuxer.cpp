@@ -1,6 +1,5 @@
 #include "writer/ExtrasMuxer.h"
 
-#include "media/FourCC.h"
 #include "media/MediaRecords.h"
 #include "writer/MatroskaLanguages.h"
 #include "writer/WriterStatus.h"
@@ -26,11 +25,9 @@ void SetTags(AVDictionary*& metadata, const Tags& tags) {
         av::CheckMemory(av_dict_set(&metadata, key.c_str(), value.c_str(), 0));
 }
 
-/// What the container can hold. Vorbis comments have one name for both the comment and the description: what
-/// would be lost goes into one text.
+/// What the container can hold. Where comment and description have one name, what would be lost goes into one
+/// text.
 Tags TagsFor(const Container& container, Tags tags) {
-    constexpr uint32_t kFlac = FourCC("FLAC");
-    constexpr uint32_t kOgg = FourCC("OGG ");
     for (auto tag = tags.begin(); tag != tags.end();)
         tag = CarriesTag(container, tag->first, tag->second) ? std::next(tag) : tags.erase(tag);
     const auto find = [&](const char* key) {
@@ -39,8 +36,7 @@ Tags TagsFor(const Container& container, Tags tags) {
     };
     const auto comment = find("comment");
     const auto description = find("description");
-    if ((container.code != kFlac && container.code != kOgg) || comment == tags.end() ||
-        description == tags.end())
+    if ((container.ways & kOneComment) == 0 || comment == tags.end() || description == tags.end())
         return tags;
     if (comment->second != description->second)
         description->second += "\n" + comment->second;
@@ -81,7 +77,7 @@ void ExtrasMuxer::SetLabel(AVStream& stream, const TrackLabel& label) const {
         if (tags.erase("language_tag") != 0 && IsMatroska())
             tags["language"] = LanguagePlace(label);
         SetTags(stream.metadata, tags);
-        if (container_.tagsInStream)
+        if ((container_.ways & kTagsInStream) != 0)
             SetTags(stream.metadata, TagsFor(container_, extras_.tags));
     }
     stream.disposition = label.flags;

@@ -99,6 +99,8 @@ constexpr uint32_t kFiles = kWriterFormatAttachments;
 constexpr uint32_t kTracks = kWriterFormatTracks;
 constexpr uint32_t kLanguages = kWriterFormatLanguages;
 constexpr uint32_t kTitles = kWriterFormatTrackTitles;
+constexpr uint32_t kTimecode = kWriterFormatTimecode;
+constexpr uint32_t kChapterTexts = kWriterFormatChapterTexts;
 // What the multiplexers write of all that can be said about a movie.
 constexpr const char* kMp4Tags = "title,artist,album,album_artist,composer,genre,date,track,disc,comment,description,"
                                  "synopsis,copyright,creation_time,location,lyrics,grouping,show,season_number,"
@@ -129,42 +131,47 @@ constexpr const char* kWavSound = "pcm_s16le,pcm_s24le,pcm_s32le,pcm_f32le,pcm_f
 constexpr const char* kClusters = "cluster_time_limit=1000"; // what is lost at most when a file is cut off
 constexpr std::array kContainers{
     Container{FourCC("MP4 "), "MP4 (MPEG-4 Part 14)", "mp4,m4v", "mp4", kFragmented, nullptr,
-              kTags | kChapters | kCover | kTracks | kLanguages | kTitles, kMp4Tags, kMp4Flags, kMp4Subtitles, kMp4Sound, false,
+              kTags | kChapters | kCover | kTracks | kLanguages | kTitles | kTimecode, kMp4Tags, kMp4Flags, kMp4Subtitles, kMp4Sound, kLanguageTags,
               {kXvid, kH264, kHevc, kMjpg, kVp9, kMpeg2, kAv1}, {kAac, kMp3, kAc3, kOpus, kVorbis}},
     Container{FourCC("MOV "), "QuickTime", "mov,qt", "mov", kFragmented, nullptr,
-              kTags | kChapters | kTracks | kLanguages | kTitles, kMovTags, kNoFlags, kMp4Subtitles, kMovSound, false,
+              kTags | kChapters | kTracks | kLanguages | kTitles | kTimecode, kMovTags, kNoFlags, kMp4Subtitles, kMovSound, kLanguageTags | kShortTags,
               {kXvid, kH264, kHevc, kMjpg, kMpeg2}, {kAac, kMp3, kAc3, kAlac, kPcm}},
     Container{FourCC("MKV "), "Matroska", "mkv", "matroska", kStreamed, kClusters,
-              kTags | kChapters | kCover | kFiles | kTracks | kLanguages | kTitles, kAnyTags, kMatroskaFlags,
-              kMatroskaSubtitles, kMatroskaSound, false,
+              kTags | kChapters | kCover | kFiles | kTracks | kLanguages | kTitles | kTimecode, kAnyTags, kMatroskaFlags,
+              kMatroskaSubtitles, kMatroskaSound, kLanguageTags,
               {kXvid, kH264, kHevc, kMjpg, kVp8, kVp9, kMpeg2, kFlv1, kAv1, kFfv1},
               {kAac, kMp3, kAc3, kFlac, kOpus, kVorbis, kAlac, kMp2, kPcm}},
+    Container{FourCC("MKA "), "Matroska audio", "mka", "matroska", kStreamed, kClusters,
+              kTags | kChapters | kCover | kFiles | kTracks | kLanguages | kTitles, kAnyTags, kMatroskaFlags,
+              kMatroskaSubtitles, kMatroskaSound, kLanguageTags,
+              {},
+              {kAac, kMp3, kAc3, kFlac, kOpus, kVorbis, kAlac, kMp2, kPcm}},
     Container{FourCC("AVI "), "AVI (Audio Video Interleaved)", "avi,divx", "avi", kSteadyRate, nullptr,
-              kTags | kTracks | kTitles, kRiffTags, kNoFlags, nullptr, kAviSound, false,
+              kTags | kTracks | kTitles, kRiffTags, kNoFlags, nullptr, kAviSound, 0,
               {kXvid, kH264, kMjpg, kVp8, kMpeg2, kFlv1}, {kMp3, kAac, kAc3, kPcm}},
     Container{FourCC("WEBM"), "WebM", "webm", "webm", kStreamed, kClusters,
-              kTags | kChapters | kTracks | kLanguages | kTitles, kAnyTags, AV_DISPOSITION_FORCED, "webvtt", "vorbis,opus", false,
+              kTags | kChapters | kTracks | kLanguages | kTitles | kTimecode, kAnyTags, AV_DISPOSITION_FORCED, "webvtt", "vorbis,opus", kLanguageTags,
               {kVp8, kVp9, kAv1}, {kVorbis, kOpus}},
     Container{FourCC("FLV "), "Flash Video", "flv", "flv", kStreamed, nullptr,
-              kTags, kAnyTags, kNoFlags, nullptr, "aac,mp3", false, {kH264, kFlv1}, {kAac, kMp3}},
+              kTags, kAnyTags, kNoFlags, nullptr, "aac,mp3", kShortTags, {kH264, kFlv1}, {kAac, kMp3}},
     Container{FourCC("TS  "), "MPEG transport stream", "ts,m2ts,mts", "mpegts", kStreamed, nullptr,
-              kTags | kTracks | kLanguages, kServiceTags, kSenses, "dvb_subtitle", kTsSound, false,
+              kTags | kTracks | kLanguages, kServiceTags, kSenses, "dvb_subtitle", kTsSound, 0,
               {kH264, kHevc, kXvid, kMpeg2}, {kAac, kMp3, kAc3, kOpus, kMp2}},
     Container{FourCC("MPG "), "MPEG program stream", "mpg,mpeg,vob", "vob", kStreamed, nullptr,
-              0, kNoTags, kNoFlags, nullptr, "mp2,mp3,ac3,dts", false, {kMpeg2}, {kMp2, kAc3}},
+              0, kNoTags, kNoFlags, nullptr, "mp2,mp3,ac3,dts", 0, {kMpeg2}, {kMp2, kAc3}},
     Container{kGif, "GIF (animated)", "gif", "gif", kStreamed, nullptr, 0, kNoTags, kNoFlags, nullptr, nullptr,
-              false, {kGif}, {}},
+              0, {kGif}, {}},
     Container{FourCC("M4A "), "MPEG-4 audio", "m4a,m4b", "ipod", kFragmented, nullptr,
-              kTags | kChapters | kCover | kTracks | kLanguages, kMp4Tags, kNoFlags, kMp4Subtitles, "aac,alac,ac3,eac3", false,
+              kTags | kChapters | kCover | kTracks | kLanguages, kMp4Tags, kNoFlags, kMp4Subtitles, "aac,alac,ac3,eac3", kLanguageTags,
               {}, {kAac, kAc3, kAlac}},
     Container{FourCC("MP3 "), "MP3", "mp3", "mp3", kStreamed, nullptr,
-              kTags | kCover, kAnyTags, kNoFlags, nullptr, "mp3", false, {}, {kMp3}},
+              kTags | kCover, kAnyTags, kNoFlags, nullptr, "mp3", 0, {}, {kMp3}},
     Container{FourCC("WAV "), "WAV (RIFF wave)", "wav", "wav", kSteadyRate, "rf64=auto",
-              kTags, kRiffTags, kNoFlags, nullptr, kWavSound, false, {}, {kPcm, kMp3, kAc3}},
+              kTags, kRiffTags, kNoFlags, nullptr, kWavSound, 0, {}, {kPcm, kMp3, kAc3}},
     Container{FourCC("FLAC"), "FLAC", "flac", "flac", kStreamed, nullptr,
-              kTags | kCover, kAnyTags, kNoFlags, nullptr, "flac", false, {}, {kFlac}},
+              kTags | kCover, kAnyTags, kNoFlags, nullptr, "flac", kOneComment, {}, {kFlac}},
     Container{FourCC("OGG "), "Ogg", "ogg,oga,opus", "ogg", kStreamed, nullptr,
-              kTags | kLanguages, kAnyTags, kNoFlags, nullptr, "vorbis,opus,flac,speex", true, {}, {kVorbis, kOpus, kFlac}},
+              kTags | kLanguages | kChapterTexts, kAnyTags, kNoFlags, nullptr, "vorbis,opus,flac,speex", kTagsInStream | kOneComment, {}, {kVorbis, kOpus, kFlac}},
 };
 
 constexpr std::array kFlashRates{44100, 22050, 11025, 0};
@@ -328,17 +335,15 @@ AVCodecID PacketForm(const Container& container, AVCodecID codec) {
 
 bool CarriesTag(const Container& container, const std::string& key, const std::string& value) {
     constexpr size_t kMost = 65535; // where lengths have 16 bits
-    const bool isShort = container.code == FourCC("MOV ") || container.code == FourCC("FLV ");
     return (container.carries & kTags) != 0 && (container.tags == nullptr || IsListed(container.tags, key)) &&
-           (!isShort || value.size() <= kMost);
+           ((container.ways & kShortTags) == 0 || value.size() <= kMost);
 }
 
 bool CarriesTrackTag(const Container& container, const std::string& key, const std::string& value) {
     if (key == "title")
         return (container.carries & kTitles) != 0;
     if (key == "language_tag")
-        return container.kind == kFragmented || container.code == FourCC("MKV ") ||
-               container.code == FourCC("WEBM");
+        return (container.ways & kLanguageTags) != 0;
     if (key != "language" || (container.carries & kLanguages) == 0)
         return false;
     constexpr size_t kLetters = 3;

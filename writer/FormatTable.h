@@ -83,6 +83,14 @@ enum class ContainerKind {
     kSteadyRate  ///< As kStreamed, but time is the number of pictures and of samples: both begin at 0.
 };
 
+/// What a container does in a way of its own.
+enum ContainerWays : uint32_t {
+    kTagsInStream = 1, ///< Texts about the movie belong to its stream.
+    kOneComment = 2,   ///< The comment and the description are one text.
+    kLanguageTags = 4, ///< Languages can have a region or a script.
+    kShortTags = 8     ///< A text about the movie has 65535 bytes at most.
+};
+
 /// A file format.
 struct Container {
     uint32_t code;
@@ -98,7 +106,7 @@ struct Container {
     const char* subtitles;
     /// FFmpeg's names of the codecs for sound whose packets fit as they are; null for none.
     const char* copiedSound;
-    bool tagsInStream;              ///< Texts about the movie belong to its stream.
+    uint32_t ways;                  ///< ContainerWays, together.
     std::array<uint32_t, 12> video; ///< Codes of the codecs that fit, the default first, then zeros.
     std::array<uint32_t, 12> audio;
 };

@@ -204,13 +204,16 @@ enum {
 enum {
     /// The file has one picture rate and knows no other times: what comes faster is left out.
     kWriterFormatSteadyRate = 1,
-    kWriterFormatTags = 2,         ///< Carries texts about the movie, as many as the format knows.
-    kWriterFormatChapters = 4,     ///< Carries chapters.
-    kWriterFormatCover = 8,        ///< Carries a cover picture.
-    kWriterFormatAttachments = 16, ///< Carries attached files, such as fonts.
-    kWriterFormatTracks = 32,      ///< Carries several tracks of sound.
-    kWriterFormatLanguages = 64,   ///< Carries the languages of tracks.
-    kWriterFormatTrackTitles = 128 ///< Carries the titles of tracks.
+    kWriterFormatTags = 2,          ///< Carries texts about the movie, as many as the format knows.
+    kWriterFormatChapters = 4,      ///< Carries chapters.
+    kWriterFormatCover = 8,         ///< Carries a cover picture.
+    kWriterFormatAttachments = 16,  ///< Carries attached files, such as fonts.
+    kWriterFormatTracks = 32,       ///< Carries several tracks of sound.
+    kWriterFormatLanguages = 64,    ///< Carries the languages of tracks.
+    kWriterFormatTrackTitles = 128, ///< Carries the titles of tracks.
+    kWriterFormatTimecode = 256,    ///< Carries a timecode, which is a text about the pictures: "timecode".
+    /// Carries chapters as texts about the movie: "CHAPTER001", which is when it begins, "CHAPTER001NAME" ...
+    kWriterFormatChapterTexts = 512
 };
 
 /// kWriterFormat... of the format with that code, together; 0 for one that is not in the table.

@@ -92,7 +92,7 @@ int AddChapters(const SourceInfo& source, uint32_t set) {
 
 /// Where chapters are texts about the movie: CHAPTER001, CHAPTER001NAME ...
 bool HoldsChapterTexts(const FileFormatInfo& format) {
-    return format.fccFormat == FourCC("OGG ");
+    return (MWGetFormatTraits(format.fccFormat) & kWriterFormatChapterTexts) != 0;
 }
 
 /// AddChapters as texts, of what lies in the one file that the request asks for.
