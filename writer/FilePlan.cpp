@@ -1,5 +1,6 @@
 #include "writer/FilePlan.h"
 
+#include "ffmpeg/ExactRate.h"
 #include "media/CodeText.h"
 #include "media/Limits.h"
 #include "media/MediaRecords.h"
@@ -97,7 +98,7 @@ PictureSettings MakePictureSettings(const EncodeParam& param, const VideoFormat&
         throw WriterFailure(kWriterErrorArgument, "Pictures of " + std::to_string(settings.width) + "x" +
                                                       std::to_string(settings.height) +
                                                       " cannot be written; choose another size.");
-    settings.rate = ExactRate(
+    settings.rate = av::ExactRate(
         FirstPositive(UsableRate(param.dFrameRate), UsableRate(source.dFrameRate), kDefaultFrameRate));
     settings.bitrate = FirstPositive(param.nVideoBitrate, kUsualVideoBitrate, 0);
     settings.maxBitrate = param.nVideoRateMode != 0 ? std::max(0, param.nVideoMaxBitrate) : 0;

@@ -7,7 +7,6 @@ extern "C" {
 }
 
 #include <algorithm>
-#include <cmath>
 #include <cstdlib>
 
 namespace writer {
@@ -19,21 +18,6 @@ constexpr AVRational kUnit{1, kTicksPerSecond};
 constexpr int64_t kGridTolerance = 2 * kTicksPerSecond / 1000;
 
 } // namespace
-
-AVRational ExactRate(double rate) {
-    constexpr double kNear = 0.005;
-    const double whole = std::round(rate);
-    if (whole >= 1 && whole <= 60000 && std::abs(rate - whole) < 0.0005)
-        return {static_cast<int>(whole), 1};
-    const double ntsc = std::round(rate * 1.001);
-    if (ntsc >= 1 && ntsc <= 1000 && std::abs(rate * 1.001 - ntsc) < kNear) {
-        AVRational exact{static_cast<int>(ntsc) * 1000, 1001};
-        av_reduce(&exact.num, &exact.den, exact.num, exact.den, 1'000'000);
-        return exact;
-    }
-    const AVRational near = av_d2q(rate, 60000);
-    return near.num > 0 ? near : AVRational{1, 60000};
-}
 
 PictureClock MakePictureClock(AVRational rate, bool wholePictures) {
     if (wholePictures)

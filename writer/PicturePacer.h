@@ -12,10 +12,6 @@ extern "C" {
 
 namespace writer {
 
-/// The fraction that a frame rate stands for: whole rates and those of the n/1001 family exactly, others as
-/// near as a fraction with terms up to 60000 comes. `rate` is a finite number above 0.
-AVRational ExactRate(double rate);
-
 /// The unit in which the times of pictures are written.
 struct PictureClock {
     AVRational rate;     ///< Pictures per second.

@@ -1,8 +1,8 @@
 #include "host/convert/Timecode.h"
 
+#include "ffmpeg/ExactRate.h"
 #include "host/convert/CodecPlan.h"
 #include "host/convert/Formats.h"
-#include "media/FourCC.h"
 #include "writer/WriterStatus.h"
 
 #include <algorithm>
@@ -50,17 +50,9 @@ const std::string* FindTimecode(const SourceInfo& source, const Request& request
     return request.noMetadata ? nullptr : TimecodeOf(source);
 }
 
-/// 30000/1001 for 29.97.
-AVRational ExactRate(double rate) {
-    const double whole = std::round(rate);
-    const bool isWhole = std::abs(rate - whole) < 0.0005 * rate;
-    return isWhole ? AVRational{static_cast<int>(whole), 1}
-                   : AVRational{static_cast<int>(std::lround(rate * 1001)), 1001};
-}
-
 /// Numbers are left out where there are not quite 30 or 60 pictures a second.
 bool CanDrop(double rate) {
-    const AVRational exact = ExactRate(rate);
+    const AVRational exact = av::ExactRate(rate);
     return exact.den == 1001 && (exact.num == 30000 || exact.num == 60000);
 }
 
@@ -68,7 +60,7 @@ bool CanDrop(double rate) {
 bool Parse(const std::string& text, double rate, AVTimecode& timecode) {
     constexpr double kMost = 1000;
     return rate >= 1 && rate <= kMost &&
-           av_timecode_init_from_string(&timecode, ExactRate(rate), text.c_str(), nullptr) >= 0;
+           av_timecode_init_from_string(&timecode, av::ExactRate(rate), text.c_str(), nullptr) >= 0;
 }
 
 /// With the pictures within its second counted at another rate.
@@ -116,12 +108,11 @@ bool HoldsTheTimecode(const SourceInfo& source, const StreamInfo& stream) {
 
 std::optional<NotCarried> WhyTimecodeStays(const SourceInfo& source, const Request& request,
                                            const FileFormatInfo& format) {
-    constexpr std::array kHolding{FourCC("MP4 "), FourCC("MOV "), FourCC("MKV "), FourCC("WEBM")};
     const std::string* timecode = FindTimecode(source, request);
     if (timecode == nullptr)
         return std::nullopt;
     std::string reason;
-    if (std::count(kHolding.begin(), kHolding.end(), format.fccFormat) == 0)
+    if ((MWGetFormatTraits(format.fccFormat) & kWriterFormatTimecode) == 0)
         reason = fmt::format("{} cannot hold it", ShortName(format));
     else if (!HasPictures(source, request))
         reason = "it belongs to the pictures";

@@ -1,5 +1,6 @@
 // Pictures on their way into the file: pitches, sizes, shapes, rates.
 #include "MovieReader.h"
+#include "ffmpeg/ExactRate.h"
 #include "writer/PicturePacer.h"
 #include "writer/PictureScaler.h"
 
@@ -168,9 +169,9 @@ TEST(ExactRate, IsTheFractionThatIsMeant) {
                        {23.98, {24000, 1001}}, {59.94, {60000, 1001}},  {14.985, {15000, 1001}},
                        {12.5, {25, 2}},        {119.88, {120000, 1001}}};
     for (const auto& known : cases)
-        EXPECT_EQ(av_cmp_q(writer::ExactRate(known.rate), known.exact), 0) << known.rate;
+        EXPECT_EQ(av_cmp_q(av::ExactRate(known.rate), known.exact), 0) << known.rate;
     for (const double rate : {0.001, 0.3, 7.123, 999.9})
-        EXPECT_NEAR(av_q2d(writer::ExactRate(rate)), rate, rate * 0.001 + 0.0001);
+        EXPECT_NEAR(av_q2d(av::ExactRate(rate)), rate, rate * 0.001 + 0.0001);
 }
 
 } // namespace
