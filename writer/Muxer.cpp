@@ -190,8 +190,8 @@ void Muxer::Write(AVPacket& packet, int stream) {
     packet_->stream_index = stream;
     const int64_t time = av_rescale_q(packet_->dts, out->time_base, av_get_time_base_q());
     output_->max_interleave_delta = MostApart(packet_->size);
-    // A cover never gets a second packet, for which the multiplexer would wait.
     const int counted = IsEmptyText(*packet_, *out) ? 0 : 1;
+    // A cover never gets a second packet, for which the multiplexer would wait.
     const bool alone = extras_.HasCoverStream() && streams_.size() == 1;
     Check(alone ? av_write_frame(output_.get(), packet_.get())
                 : av_interleaved_write_frame(output_.get(), packet_.get()),

@@ -160,7 +160,7 @@ std::string WhySoundStays(const SourceInfo& source, const StreamInfo& stream, co
                           bool copies) {
     if (format.bHasAudio == 0)
         return fmt::format("{} cannot hold it", ShortName(format));
-    if ((MWGetFormatTraits(format.fccFormat) & kWriterFormatTracks) == 0)
+    if (!HoldsSeveralTracks(format))
         return fmt::format("{} holds one track of sound, MKV and MP4 hold several", ShortName(format));
     if (!stream.decodable || !stream.sound || stream.sound->sampleRate <= 0 || stream.sound->channels <= 0)
         return "it cannot be decoded";

@@ -76,16 +76,15 @@ std::optional<double> PreferredQuality(const Preferences& preferences, uint32_t 
 
 /// Throws Failure when the codec has no scale or another one.
 void RequireQuality(uint32_t codec, double quality) {
-    double best = 0;
-    double worst = 0;
-    if (MWGetQualityScale(codec, &best, &worst) == 0) {
+    const std::optional<QualityScale> scale = QualityScaleOf(codec);
+    if (!scale) {
         throw Failure(Category::kRequest,
                       fmt::format("\"{}\" has no constant quality; give it a bit rate", CodeName(codec)));
     }
-    if (!(quality >= best && quality <= worst)) { // nor what is no number
+    if (!(quality >= scale->best && quality <= scale->worst)) { // nor what is no number
         throw Failure(Category::kRequest,
                       fmt::format("the quality of \"{}\" goes from {} (best) to {}, not to {}",
-                                  CodeName(codec), best, worst, quality));
+                                  CodeName(codec), scale->best, scale->worst, quality));
     }
 }
 
@@ -172,9 +171,7 @@ bool HasRates(const Request& request, const FileFormatInfo& format, const Source
     if (!source.pictures || format.bHasVideo == 0)
         return true;
     const PicturePlan plan = PlanPictures(request, format, *source.pictures);
-    double best = 0;
-    double worst = 0;
-    const bool lossless = plan.codec && MWGetQualityScale(*plan.codec, &best, &worst) == 0;
+    const bool lossless = plan.codec && !QualityScaleOf(*plan.codec);
     return !plan.quality && !lossless;
 }
 

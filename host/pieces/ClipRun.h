@@ -26,8 +26,6 @@ public:
 
 private:
     void Prepare();
-    void Begin();
-    void Note(const OpenedFile& opened);
 
     // News of the conversion, on its thread.
     void Started(const struct Start& news) override;
