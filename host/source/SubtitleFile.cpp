@@ -47,10 +47,13 @@ std::optional<std::string> Convert(const std::string& text, const std::string& c
     char* out = converted.data();
     std::size_t inLeft = from.size();
     std::size_t outLeft = converted.size();
-    const std::size_t result = iconv(converter, &in, &inLeft, &out, &outLeft);
+    constexpr auto kFailed = static_cast<std::size_t>(-1);
+    // Where accents follow their letters, the last letter is kept until it is asked for.
+    const bool isConverted = iconv(converter, &in, &inLeft, &out, &outLeft) != kFailed &&
+                             iconv(converter, nullptr, nullptr, &out, &outLeft) != kFailed;
     iconv_close(converter);
     converted.resize(converted.size() - outLeft);
-    return result == static_cast<std::size_t>(-1) ? std::nullopt : std::optional(std::move(converted));
+    return isConverted ? std::optional(std::move(converted)) : std::nullopt;
 }
 
 bool HasMark(std::string_view text) {

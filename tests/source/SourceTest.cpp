@@ -4,6 +4,7 @@
 #include "host/source/Demuxer.h"
 #include "host/source/Failures.h"
 #include "host/source/StreamChoice.h"
+#include "host/source/SubtitleFile.h"
 #include "tests/support/Inspect.h"
 #include "tests/support/Program.h"
 #include "tests/support/TestMovies.h"
@@ -208,6 +209,10 @@ TEST(Source, ReadingAheadIsInterruptedWithIt) {
     EXPECT_EQ(ReadCues(source, wish, false).cues.size(), 1);
     interruption->Interrupt();
     EXPECT_THROW(ReadCues(source, wish, false), SourceError);
+}
+
+TEST(CharacterSets, WithAccentsBehindTheirLettersKeepTheLastLetter) {
+    EXPECT_EQ(movieconv::ToUtf8("ch\xE0o", "CP1258"), "ch\xC3\xA0o");
 }
 
 } // namespace
