@@ -7,6 +7,16 @@
 #include <utility>
 
 namespace movieconv {
+namespace {
+
+/// In media time. Damaged stamps can be anything; those beyond leave room for sums with them.
+constexpr int64_t kFarthest = int64_t{1} << 60;
+
+int64_t WithinReason(int64_t mediaTime) {
+    return std::clamp(mediaTime, -kFarthest, kFarthest);
+}
+
+} // namespace
 
 MovieReader::MovieReader(const std::string& path, bool playlists, Growth growth,
                          std::shared_ptr<Interruption> interruption)
@@ -16,7 +26,7 @@ MovieReader::MovieReader(const std::string& path, bool playlists, Growth growth,
       interruption_(std::move(interruption)),
       file_(std::make_unique<MovieFile>(path, playlists, growth, interruption_)) {
     if (const int64_t start = Context()->start_time; start != AV_NOPTS_VALUE)
-        start_ = av_rescale_q(start, {1, AV_TIME_BASE}, {1, kTicksPerSecond});
+        start_ = WithinReason(av_rescale_q(start, {1, AV_TIME_BASE}, {1, kTicksPerSecond}));
 }
 
 void MovieReader::Select(std::vector<int> streams) {
@@ -38,8 +48,7 @@ void MovieReader::DiscardOthers() {
 }
 
 int64_t MovieReader::MediaTime(int64_t stamp, AVRational timeBase) const {
-    constexpr int64_t kFarthest = int64_t{1} << 60; // room for sums with what damaged stamps tell
-    return std::clamp(av_rescale_q(stamp, timeBase, {1, kTicksPerSecond}), -kFarthest, kFarthest) - start_;
+    return WithinReason(av_rescale_q(stamp, timeBase, {1, kTicksPerSecond})) - start_;
 }
 
 bool MovieReader::IsSeekable() const {

@@ -214,7 +214,7 @@ StreamFlags FlagsOf(const AVStream* stream) {
 
 /// A stamp in seconds from `start`.
 double SecondsFrom(int64_t start, int64_t stamp, AVRational timeBase) {
-    return ToSeconds(av_rescale_q(stamp, timeBase, {1, kTicksPerSecond}) - start);
+    return ToSeconds(av_sat_sub64(av_rescale_q(stamp, timeBase, {1, kTicksPerSecond}), start));
 }
 
 StreamInfo DescribeStream(AVFormatContext& context, AVStream* stream, int64_t start) {
