@@ -1,13 +1,7 @@
 // FFmpeg's lines for the host's log function.
+#include "ffmpeg/LogLine.h"
 #include "platform/LogRoute.h"
 #include "writer/WriterStatus.h"
-
-extern "C" {
-#include <libavutil/log.h>
-}
-
-#include <cstdarg>
-#include <cstring>
 
 namespace {
 
@@ -19,20 +13,12 @@ int LevelOf(int level) {
     return level <= AV_LOG_INFO ? kLogInfo : kLogDebug;
 }
 
-/// FFmpeg makes a line of several calls; the last piece has the line end.
 void Forward(void* source, int level, const char* format, va_list arguments) {
-    if ((level & 0xFF) > av_log_get_level()) // the upper bits are colours
+    if (av::LogLevel(level) > av_log_get_level())
         return;
-    static thread_local int prefix = 1;
-    static thread_local char line[1024];
-    static thread_local std::size_t length = 0;
-    av_log_format_line2(source, level & 0xFF, format, arguments, line + length,
-                        static_cast<int>(sizeof line - length), &prefix);
-    length += std::strlen(line + length);
-    if (length + 1 < sizeof line && (length == 0 || line[length - 1] != '\n'))
-        return;
-    length = 0;
-    LogRouteTakeUtf8(LevelOf(level & 0xFF), line);
+    static thread_local av::LogLine line;
+    if (const char* whole = line.Add(source, level, format, arguments))
+        LogRouteTakeUtf8(LevelOf(av::LogLevel(level)), whole);
 }
 
 } // namespace

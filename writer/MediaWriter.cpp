@@ -158,7 +158,8 @@ uint32_t MWRegisterOptions(const WriterOptions* options) {
 
 int MWGetQualityScale(uint32_t code, double* best, double* worst) {
     const writer::PictureCodec* codec = writer::FindPictureCodec(code);
-    if (codec == nullptr || codec->quality.kind == writer::QualityKind::kNone)
+    if (codec == nullptr || codec->quality.kind == writer::QualityKind::kNone || best == nullptr ||
+        worst == nullptr)
         return 0;
     *best = codec->quality.best;
     *worst = codec->quality.worst;

@@ -397,7 +397,7 @@ void MWForwardLog(int forward);
 uint32_t MWFindCodec(uint32_t format, uint32_t code, int forSound);
 
 /// The scale of a picture codec's constant quality, from the best figure to the worst. Returns 1; 0 when the
-/// codec has none or is not known.
+/// codec has none or is not known, or a place for the figures is null.
 int MWGetQualityScale(uint32_t code, double* best, double* worst);
 
 /// Most bits of a component that a picture codec can be given, 8 or 10; 0 when it is not known.

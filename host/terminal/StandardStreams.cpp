@@ -1,14 +1,11 @@
 #include "host/terminal/StandardStreams.h"
 
+#include "ffmpeg/LogLine.h"
 #include "host/convert/Failure.h"
 #include "host/terminal/SideFile.h"
 #include "logsink/LogSink.h"
 #include "text/Utf8.h"
 #include "text/WriteAll.h"
-
-extern "C" {
-#include <libavutil/log.h>
-}
 
 #include <cerrno>
 #include <cstdio>
@@ -32,13 +29,14 @@ Failure CannotWriteLog(const std::string& path) {
 
 /// FFmpeg's messages, a line each, as they would be shown at its usual level.
 void LogFfmpeg(void* source, int level, const char* format, va_list arguments) {
-    if (level > AV_LOG_WARNING)
+    if (av::LogLevel(level) > AV_LOG_WARNING)
         return;
-    static thread_local int prefix = 1;
-    char line[1024];
-    av_log_format_line2(source, level, format, arguments, line, sizeof line, &prefix);
+    static thread_local av::LogLine line;
+    const char* const whole = line.Add(source, level, format, arguments);
+    if (whole == nullptr)
+        return;
     try {
-        ::Log(text::FromUtf8(line).c_str());
+        ::Log(text::FromUtf8(whole).c_str());
     } catch (const std::bad_alloc&) { // the line is lost; FFmpeg's threads know no exceptions
     }
 }
