@@ -1,11 +1,11 @@
 #include "writer/FragmentLog.h"
 
+#include "ffmpeg/Mp4Box.h"
 #include "writer/BigEndian.h"
 #include "writer/WriterFailure.h"
 #include "writer/WriterStatus.h"
 
 #include <algorithm>
-#include <cstring>
 #include <new>
 #include <utility>
 
@@ -37,21 +37,16 @@ public:
 
     /// The content of the next box, whose type is stored.
     BoxReader Box(uint32_t& type) {
-        const uint32_t size = U32();
-        type = U32();
-        if (size < kBoxHeader)
+        const auto head = av::ReadBoxHead(bytes_.data(), bytes_.size());
+        if (!head || head->size == av::BoxHead::kOpen)
             ThrowSenseless();
-        return BoxReader(Take(size - kBoxHeader));
+        type = head->type;
+        return BoxReader(Take(static_cast<size_t>(head->size)).subspan(static_cast<size_t>(head->headSize)));
     }
 
 private:
     std::span<const uint8_t> bytes_;
 };
-
-constexpr uint32_t Type(const char (&name)[5]) {
-    return uint32_t{static_cast<uint8_t>(name[0])} << 24 | static_cast<uint8_t>(name[1]) << 16 |
-           static_cast<uint8_t>(name[2]) << 8 | static_cast<uint8_t>(name[3]);
-}
 
 constexpr uint32_t kNotKey = 0x10000; // in the flags of a sample
 
@@ -62,11 +57,11 @@ public:
         : next_(base), base_(base), take_(take) {}
 
     void Take(uint32_t type, BoxReader content) {
-        if (type == Type("tfhd"))
+        if (type == av::BoxType("tfhd"))
             TakeHeader(content);
-        else if (type == Type("tfdt"))
+        else if (type == av::BoxType("tfdt"))
             dts_ = static_cast<int64_t>(content.U32() >> 24 == 1 ? content.Number(8) : content.U32());
-        else if (type == Type("trun"))
+        else if (type == av::BoxType("trun"))
             TakeRun(content);
     }
 
@@ -118,7 +113,7 @@ void ReadFragment(std::span<const uint8_t> head, int64_t position,
     BoxReader parts = BoxReader(head).Box(type);
     while (!parts.Empty()) {
         BoxReader part = parts.Box(type);
-        if (type != Type("traf"))
+        if (type != av::BoxType("traf"))
             continue;
         TrackRuns track(position, take);
         while (!part.Empty()) {
@@ -162,11 +157,11 @@ void FragmentLog::Collect(const uint8_t* data, int64_t size) {
     const uint32_t type = header.U32();
     if (whole < kBoxHeader)
         ThrowSenseless();
-    if (type == Type("moof") && box_.size() < whole) {
+    if (type == av::BoxType("moof") && box_.size() < whole) {
         box_.reserve(whole);
         return;
     }
-    if (type == Type("moof")) {
+    if (type == av::BoxType("moof")) {
         size_ += static_cast<int64_t>(sizeof(Fragment) + box_.size());
         fragments_.push_back({boxPosition_, std::exchange(box_, {})});
     }

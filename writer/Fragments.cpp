@@ -1,6 +1,6 @@
 #include "writer/Fragments.h"
 
-#include "writer/BigEndian.h"
+#include "ffmpeg/Mp4Box.h"
 #include "writer/TextRows.h"
 #include "writer/WriterFailure.h"
 #include "writer/WriterStatus.h"
@@ -9,7 +9,6 @@
 #include <array>
 #include <cerrno>
 #include <cstdio>
-#include <cstring>
 #include <new>
 #include <optional>
 
@@ -61,45 +60,28 @@ bool ReadAll(ByteFile& file, int64_t position, uint8_t* data, int64_t size) {
     return true;
 }
 
-constexpr int64_t kBoxHeaderSize = 8;
-
-struct Box {
-    std::array<char, 4> type;
-    int64_t size; ///< With its header; 0 when the header is not whole or makes no sense.
-
-    bool Is(const char* name) const { return std::memcmp(type.data(), name, type.size()) == 0; }
-};
-
-int64_t SizeFrom(const uint8_t* bytes, size_t size) {
-    return static_cast<int64_t>(BigEndian(bytes, size));
-}
-
-Box ReadBox(ByteFile& file, int64_t position) {
-    std::array<uint8_t, 16> header{};
-    int64_t headerSize = kBoxHeaderSize;
-    if (!ReadAll(file, position, header.data(), headerSize))
-        return {};
-    Box box{{}, SizeFrom(header.data(), 4)};
-    std::memcpy(box.type.data(), &header[4], box.type.size());
-    if (box.size == 1) {
-        headerSize = 16;
-        if (!ReadAll(file, position + 8, &header[8], 8))
-            return {};
-        box.size = SizeFrom(&header[8], 8);
-    }
-    return box.size < headerSize ? Box{} : box;
+/// The head of the box at `position`, of the `left` bytes that follow; nothing when it is not whole, or makes
+/// no sense.
+std::optional<av::BoxHead> ReadBoxHead(ByteFile& file, int64_t position, int64_t left) {
+    std::array<uint8_t, av::BoxHead::kMostSize> bytes{};
+    const int64_t count = std::min<int64_t>(left, bytes.size());
+    const auto head = ReadAll(file, position, bytes.data(), count)
+                          ? av::ReadBoxHead(bytes.data(), static_cast<size_t>(count))
+                          : std::nullopt;
+    return head && head->size != av::BoxHead::kOpen ? head : std::nullopt;
 }
 
 /// Whether it is of a type that a fragmented file consists of.
-bool IsPartOfFile(const Box& box) {
-    constexpr std::array kTypes{"ftyp", "free", "moov", "moof", "mdat", "mfra"};
-    return std::any_of(kTypes.begin(), kTypes.end(), [&](const char* type) { return box.Is(type); });
+bool IsPartOfFile(const av::BoxHead& box) {
+    constexpr std::array kTypes{av::BoxType("ftyp"), av::BoxType("free"), av::BoxType("moov"),
+                                av::BoxType("moof"), av::BoxType("mdat"), av::BoxType("mfra")};
+    return std::find(kTypes.begin(), kTypes.end(), box.type) != kTypes.end();
 }
 
 /// Whether the fragment whose head begins at `head` has its data in `data`, the box at `dataAt`, and nothing
 /// else is there. Without memory to find out: as if it were so.
-bool HoldsAll(ByteFile& part, int64_t head, int64_t dataAt, const Box& data) {
-    if (!data.Is("mdat"))
+bool HoldsAll(ByteFile& part, int64_t head, int64_t dataAt, const av::BoxHead& data) {
+    if (data.type != av::BoxType("mdat"))
         return false;
     const int64_t end = dataAt + data.size;
     int64_t begin = end;
@@ -119,7 +101,7 @@ bool HoldsAll(ByteFile& part, int64_t head, int64_t dataAt, const Box& data) {
     } catch (const WriterFailure&) {
         return false;
     }
-    return begin == dataAt + kBoxHeaderSize && reached == end && sum == end - begin;
+    return begin == dataAt + data.headSize && reached == end && sum == end - begin;
 }
 
 [[noreturn]] void ThrowIncomplete() {
@@ -219,19 +201,19 @@ int64_t WholeFragments(ByteFile& part, int64_t size) {
     int64_t whole = 0;
     int64_t head = -1; // where that of a fragment begins whose data comes next
     for (int64_t position = 0;;) {
-        const bool boxFollows = size - position >= kBoxHeaderSize;
-        const Box box = boxFollows ? ReadBox(part, position) : Box{};
+        const bool boxFollows = size - position >= int64_t{av::BoxHead::kLeastSize};
+        const std::optional<av::BoxHead> box = ReadBoxHead(part, position, size - position);
         // Data that is shorter than its box says ends in the midst of another one.
-        if (boxFollows && !IsPartOfFile(box))
+        if (boxFollows && (!box || !IsPartOfFile(*box)))
             return whole;
         if (head < 0)
             whole = position;
-        if (box.size == 0 || box.size > size - position)
+        if (!box || box->size > size - position)
             return whole;
-        if (head >= 0 && !HoldsAll(part, head, position, box))
+        if (head >= 0 && !HoldsAll(part, head, position, *box))
             return whole;
-        head = box.Is("moof") ? position : -1;
-        position += box.size;
+        head = box->type == av::BoxType("moof") ? position : -1;
+        position += box->size;
     }
 }
 

@@ -1,5 +1,6 @@
 #include "writer/Mp4Index.h"
 
+#include "writer/BigEndian.h"
 #include "writer/WriterFailure.h"
 #include "writer/WriterStatus.h"
 
@@ -25,9 +26,7 @@ size_t FindMoov(const std::vector<uint8_t>& kept) {
         if (name < 4)
             continue;
         const size_t begin = name - 4;
-        const size_t size = size_t{kept[begin]} << 24 | size_t{kept[begin + 1]} << 16 |
-                            size_t{kept[begin + 2]} << 8 | size_t{kept[begin + 3]};
-        if (begin + size == kept.size())
+        if (begin + BigEndian(&kept[begin], 4) == kept.size())
             return begin;
     }
     throw WriterFailure(kWriterErrorEncode, "The container has no index.");

@@ -1,31 +1,34 @@
 #include "writer/Mp4Tracks.h"
 
+#include "ffmpeg/Mp4Box.h"
 #include "writer/BigEndian.h"
 
 #include <algorithm>
 #include <array>
 #include <cstddef>
-#include <cstring>
+#include <optional>
 
 namespace writer {
 namespace {
 
-constexpr size_t kHeadSize = 8;
+constexpr int kHeadSize = 8; // of boxes below 4 GB
+
+/// The head of the box between `begin` and `end`, which holds it whole; nothing where there is none.
+std::optional<av::BoxHead> BoxAt(const uint8_t* begin, const uint8_t* end) {
+    const auto head = av::ReadBoxHead(begin, static_cast<size_t>(end - begin));
+    return head && head->headSize == kHeadSize && head->size != av::BoxHead::kOpen &&
+                   head->size <= end - begin
+               ? head
+               : std::nullopt;
+}
 
 /// Calls `take` with the type of each box from `begin` to `end`, and where its content begins and ends.
 template <class Take>
 void ForEachBox(uint8_t* begin, uint8_t* end, Take take) {
-    while (static_cast<size_t>(end - begin) >= kHeadSize) {
-        const auto size = static_cast<size_t>(BigEndian(begin, 4));
-        if (size < kHeadSize || size > static_cast<size_t>(end - begin))
-            return;
-        take(reinterpret_cast<const char*>(begin + 4), begin + kHeadSize, begin + size);
-        begin += size;
+    while (const auto head = BoxAt(begin, end)) {
+        take(head->type, begin + kHeadSize, begin + head->size);
+        begin += head->size;
     }
-}
-
-bool Is(const char* type, const char* name) {
-    return std::memcmp(type, name, 4) == 0;
 }
 
 void SetSize(uint8_t* box, size_t size) {
@@ -63,14 +66,14 @@ std::vector<uint8_t> LanguageBox(const std::string& tag) {
 uint8_t* Correct(uint8_t* begin, uint8_t* end, const Mp4Track& track, uint8_t*& media) {
     constexpr uint8_t kEnabled = 1; // in the last of the flags, which follow the version
     uint8_t* place = nullptr;
-    ForEachBox(begin, end, [&](const char* type, uint8_t* content, uint8_t* contentEnd) {
-        if (Is(type, "tkhd") && contentEnd - content >= 4 && track.hides)
+    ForEachBox(begin, end, [&](uint32_t type, uint8_t* content, uint8_t* contentEnd) {
+        if (type == av::BoxType("tkhd") && contentEnd - content >= 4 && track.hides)
             content[3] = static_cast<uint8_t>(content[3] & ~kEnabled);
-        if (!Is(type, "mdia"))
+        if (type != av::BoxType("mdia"))
             return;
         media = content - kHeadSize;
-        ForEachBox(content, contentEnd, [&](const char* inner, uint8_t* head, uint8_t* headEnd) {
-            if (!Is(inner, "mdhd"))
+        ForEachBox(content, contentEnd, [&](uint32_t inner, uint8_t* head, uint8_t* headEnd) {
+            if (inner != av::BoxType("mdhd"))
                 return;
             SetLanguage(head, headEnd, track.language);
             place = headEnd;
@@ -95,16 +98,14 @@ size_t CorrectTrack(std::vector<uint8_t>& moov, size_t at, size_t size, const Mp
 } // namespace
 
 void CorrectTracks(std::vector<uint8_t>& moov, const std::vector<Mp4Track>& tracks) {
-    if (moov.size() < kHeadSize)
-        return;
     size_t at = kHeadSize;
-    for (size_t next = 0; next < tracks.size() && at + kHeadSize <= moov.size();) {
-        const auto size = static_cast<size_t>(BigEndian(&moov[at], 4));
-        if (size < kHeadSize || size > moov.size() - at)
+    for (size_t next = 0; next < tracks.size() && at < moov.size();) {
+        const auto head = BoxAt(&moov[at], moov.data() + moov.size());
+        if (!head)
             return;
-        size_t added = 0;
-        if (Is(reinterpret_cast<const char*>(&moov[at + 4]), "trak"))
-            added = CorrectTrack(moov, at, size, tracks[next++]);
+        const auto size = static_cast<size_t>(head->size);
+        const size_t added =
+            head->type == av::BoxType("trak") ? CorrectTrack(moov, at, size, tracks[next++]) : 0;
         at += size + added;
     }
 }

@@ -1,5 +1,6 @@
 #include "host/source/Completeness.h"
 
+#include "ffmpeg/Mp4Box.h"
 #include "host/source/ContainerParts.h"
 
 #include <algorithm>
@@ -27,8 +28,7 @@ bool Has(const Header& header, std::size_t at, std::string_view name) {
 
 /// MP4 and its like: boxes one behind another. Only those that hold a movie count, whatever follows them.
 bool BoxesAreCutOff(const InputFile& file) {
-    constexpr std::array<uint32_t, 3> kVital{MKBETAG('m', 'd', 'a', 't'), MKBETAG('m', 'o', 'o', 'f'),
-                                             MKBETAG('m', 'o', 'o', 'v')};
+    constexpr std::array kVital{av::BoxType("mdat"), av::BoxType("moof"), av::BoxType("moov")};
     for (int64_t at = 0;;) {
         const std::optional<PartHead> box = ReadBoxHead(file, at);
         if (!box || box->size == PartHead::kOpen)

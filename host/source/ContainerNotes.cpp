@@ -1,10 +1,10 @@
 #include "host/source/ContainerNotes.h"
 
+#include "ffmpeg/Mp4Box.h"
 #include "host/source/ContainerParts.h"
 #include "host/source/Languages.h"
 
 #include <cstdint>
-#include <string_view>
 
 extern "C" {
 #include <libavutil/avstring.h>
@@ -13,24 +13,17 @@ extern "C" {
 namespace movieconv {
 namespace {
 
-constexpr uint64_t BoxName(std::string_view name) {
-    uint64_t number = 0;
-    for (const char letter : name)
-        number = number << 8 | static_cast<unsigned char>(letter);
-    return number;
-}
-
 ContainerNotes OfMp4(const InputFile& file) {
     constexpr int64_t kVersionAndFlags = 4;
     constexpr int64_t kLongestTag = 36 + kVersionAndFlags; // with its end
     constexpr int64_t kLongestTitle = 4096;
     ContainerNotes notes;
     Parts boxes(file, ReadBoxHead);
-    boxes.ForEach(boxes.Find(boxes.Whole(), BoxName("moov")), [&](const Part& track) {
-        if (track.name != BoxName("trak"))
+    boxes.ForEach(boxes.Find(boxes.Whole(), av::BoxType("moov")), [&](const Part& track) {
+        if (track.name != av::BoxType("trak"))
             return true;
-        const Part language = boxes.Find(boxes.Find(track, BoxName("mdia")), BoxName("elng"));
-        const Part title = boxes.Find(boxes.Find(track, BoxName("udta")), BoxName("name"));
+        const Part language = boxes.Find(boxes.Find(track, av::BoxType("mdia")), av::BoxType("elng"));
+        const Part title = boxes.Find(boxes.Find(track, av::BoxType("udta")), av::BoxType("name"));
         notes.streams.push_back({LanguageTagFrom(boxes.Text(language, kVersionAndFlags, kLongestTag)),
                                  boxes.Text(title, 0, kLongestTitle)});
         return true;

@@ -1,11 +1,10 @@
 #include "host/source/ContainerParts.h"
 
+#include "ffmpeg/Mp4Box.h"
+
+#include <algorithm>
 #include <array>
 #include <cstddef>
-
-extern "C" {
-#include <libavutil/intreadwrite.h>
-}
 
 namespace movieconv {
 namespace {
@@ -31,17 +30,13 @@ Marked ReadMarked(const uint8_t* bytes, int mostBytes, bool keepMark) {
 } // namespace
 
 std::optional<PartHead> ReadBoxHead(const InputFile& file, int64_t at) {
-    std::array<uint8_t, 16> head{};
-    const int count = file.ReadAt(at, head.data(), head.size());
-    if (count < 8)
+    std::array<uint8_t, av::BoxHead::kMostSize> bytes{};
+    const int count = file.ReadAt(at, bytes.data(), bytes.size());
+    const auto head = av::ReadBoxHead(bytes.data(), static_cast<std::size_t>(std::max(count, 0)));
+    if (!head)
         return std::nullopt;
-    const uint32_t told = AV_RB32(head.data());
-    const bool isLong = told == 1 && count == 16;
-    const int64_t headSize = isLong ? 16 : 8;
-    const int64_t size = isLong ? static_cast<int64_t>(AV_RB64(head.data() + 8)) : int64_t{told};
-    if (told != 0 && size < headSize)
-        return std::nullopt;
-    return PartHead{AV_RB32(head.data() + 4), headSize, told == 0 ? PartHead::kOpen : size};
+    return PartHead{head->type, head->headSize,
+                    head->size != av::BoxHead::kOpen ? head->size : PartHead::kOpen};
 }
 
 std::optional<PartHead> ReadElementHead(const InputFile& file, int64_t at) {
