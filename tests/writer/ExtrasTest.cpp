@@ -189,6 +189,7 @@ TEST_F(Extras, OddOnesAreTakenOrRefused) {
     EXPECT_EQ(MWSetCover(set, nullptr, 13), 0);
     EXPECT_EQ(MWAddAttachment(set, "", "font/ttf", "x", 1), 0);
     EXPECT_EQ(MWAddAttachment(set, "a", "font/ttf", "x", 0), 0);
+    EXPECT_EQ(MWDescribeAttachment(set, "of nothing"), 0);
     for (int number = 0; number < 300; ++number)
         EXPECT_EQ(MWAddChapter(set, number * kSecond / 150, (number + 1) * kSecond / 150, "Same"), 1);
     std::string cover = kJpeg + std::string(20 << 20, 'x');
