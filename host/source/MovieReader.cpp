@@ -10,10 +10,10 @@ namespace movieconv {
 namespace {
 
 /// In media time. Damaged stamps can be anything; those beyond leave room for sums with them.
-constexpr int64_t kFarthest = int64_t{1} << 60;
+constexpr int64_t kFarthestTime = int64_t{1} << 60;
 
 int64_t WithinReason(int64_t mediaTime) {
-    return std::clamp(mediaTime, -kFarthest, kFarthest);
+    return std::clamp(mediaTime, -kFarthestTime, kFarthestTime);
 }
 
 } // namespace
