@@ -92,6 +92,10 @@ TEST_F(PicturesTest, ConvertsMoviesWithALivePicture) {
         [&] { return !picture->Picture().isNull() && (At(0).figures.fraction > 0.3 || At(0).IsOver()); }));
     QApplication::processEvents(); // the words just shown get their places
     Photograph("work");
+    QApplication::setPalette(OwnPalette(true)); // as the desktop does it in the evening, in the middle
+    QApplication::processEvents();
+    Photograph("dark");
+    QApplication::setPalette(OwnPalette(false));
     ASSERT_TRUE(AwaitDone());
     for (size_t row = 0; row < 4; ++row) {
         EXPECT_EQ(At(row).state, State::kDone) << At(row).outcome.sentence.toStdString();
@@ -100,11 +104,6 @@ TEST_F(PicturesTest, ConvertsMoviesWithALivePicture) {
     view->Select(At(0).id);
     QApplication::processEvents();
     Photograph("done");
-    QApplication::setPalette(OwnPalette(true));
-    view->Select(At(4).id);
-    QApplication::processEvents();
-    Photograph("dark");
-    QApplication::setPalette(OwnPalette(false));
 }
 
 namespace {

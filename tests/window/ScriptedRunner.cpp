@@ -127,7 +127,9 @@ MovieFacts ScriptedRunner::Look(const std::string& path) {
     facts.rate = 25;
     facts.pictureCodec = QStringLiteral("h264");
     facts.sounds = {{1, QStringLiteral("en"), {}, QStringLiteral("aac, stereo")},
-                    {2, QStringLiteral("de"), QStringLiteral("Kommentar"), QStringLiteral("aac, stereo")}};
+                    {2, QStringLiteral("de"),
+                     QStringLiteral("Kommentar & mehr, von allen, die dabei waren und noch etwas wissen"),
+                     QStringLiteral("aac, stereo")}};
     facts.subtitles = {{3, QStringLiteral("fre"), {}, QStringLiteral("subrip")}};
     for (int number = 1; number < subtitles; ++number)
         facts.subtitles.push_back(

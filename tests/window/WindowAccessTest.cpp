@@ -111,7 +111,8 @@ QStringList CutWords(const QWidget& window) {
         const QString words = label != nullptr    ? label->text()
                               : button != nullptr ? button->text()
                                                   : QString();
-        if (widget->isVisible() && !words.isEmpty() && widget->toolTip() != words &&
+        if (widget->isVisible() && !words.isEmpty() &&
+            widget->toolTip() != QString(words).replace(QLatin1String("&&"), QLatin1String("&")) &&
             !(label != nullptr && label->wordWrap()) && widget->width() < widget->sizeHint().width())
             cut += words;
         const auto* scroll = qobject_cast<const QScrollArea*>(widget);

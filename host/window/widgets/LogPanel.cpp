@@ -15,7 +15,8 @@ LogPanel::LogPanel(QWidget* parent) : QWidget(parent), button_(new QToolButton),
     button_->setAccessibleDescription(tr("Shows or hides what happened during the conversion"));
     text_->setReadOnly(true);
     text_->setAccessibleName(tr("Log of the conversion"));
-    text_->setFixedHeight(120);
+    text_->setMinimumHeight(48);
+    text_->setMaximumHeight(120);
     text_->setTabChangesFocus(true);
     text_->hide();
     auto* layout = new QVBoxLayout(this);

@@ -64,7 +64,7 @@ MainWindow::MainWindow(Queue& queue, Dispatcher& dispatcher, Runner& runner, Set
       overPage_(new OverPage) {
     setWindowTitle(tr("MovieConv"));
     setAcceptDrops(true);
-    setMinimumSize(760, 520);
+    setMinimumSize(760, 440); // within half of 1920 x 1080
     resize(1080, 720);
     MakeMovieMenu();
     MakeQueueMenu();

@@ -6,6 +6,8 @@
 #include <QCheckBox>
 #include <QHBoxLayout>
 #include <QPushButton>
+#include <QStyleOptionButton>
+#include <QStylePainter>
 
 namespace movieconv::window {
 namespace {
@@ -16,6 +18,29 @@ constexpr qsizetype kMany = 4;
 QString WordsOf(const TrackFacts& track) {
     return TrackLine(track).replace(QLatin1Char('&'), QLatin1String("&&"));
 }
+
+/// A box for a track, whose title may be of any length: it is cut where there is no room, and whole in the
+/// tool tip.
+class TrackBox : public QCheckBox {
+public:
+    explicit TrackBox(const TrackFacts& track) : QCheckBox(WordsOf(track)) {
+        setToolTip(ForToolTip(TrackLine(track)));
+        setSizePolicy(QSizePolicy::Preferred, QSizePolicy::Fixed);
+    }
+    QSize minimumSizeHint() const override {
+        constexpr int kNarrow = 120;
+        return {kNarrow, QCheckBox::minimumSizeHint().height()};
+    }
+
+protected:
+    void paintEvent(QPaintEvent*) override {
+        QStyleOptionButton option;
+        initStyleOption(&option);
+        const int room = style()->subElementRect(QStyle::SE_CheckBoxContents, &option, this).width();
+        option.text = fontMetrics().elidedText(text(), Qt::ElideRight, room, Qt::TextShowMnemonic);
+        QStylePainter(this).drawControl(QStyle::CE_CheckBox, option);
+    }
+};
 
 } // namespace
 
@@ -56,7 +81,7 @@ void TrackChoice::Fill(const std::vector<TrackFacts>& tracks) {
     qDeleteAll(checks_);
     checks_.clear();
     for (const TrackFacts& track : tracks) {
-        auto* check = new QCheckBox(WordsOf(track));
+        auto* check = new TrackBox(track);
         connect(check, &QCheckBox::toggled, this, [this] {
             if (!filling_)
                 Tell();

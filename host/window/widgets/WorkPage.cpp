@@ -25,7 +25,7 @@ void SetText(QLabel& label, const QString& text) {
 } // namespace
 
 PictureView::PictureView(QWidget* parent) : QWidget(parent) {
-    setMinimumSize(160, 90);
+    setMinimumSize(160, 40); // notices above may need the room
     setSizePolicy(QSizePolicy::Expanding, QSizePolicy::Expanding);
     setAccessibleName(tr("The picture that is being converted"));
 }
