@@ -586,6 +586,10 @@
         <translation>%1 davon gehören zu anderen Fassungen oder stehen innerhalb anderer</translation>
     </message>
     <message>
+        <source>%1 of them have titles in further languages</source>
+        <translation>%1 davon haben Titel in weiteren Sprachen</translation>
+    </message>
+    <message>
         <source>timecode</source>
         <translation>Zeitcode</translation>
     </message>
