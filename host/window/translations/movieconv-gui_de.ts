@@ -1039,7 +1039,7 @@
     </message>
     <message>
         <source>%1:1: a preset is a JSON object, in braces</source>
-        <translation type="unfinished">%1: eine Vorlage ist ein JSON-Objekt in geschweiften Klammern {1:1:?}</translation>
+        <translation>%1:1: eine Vorlage ist ein JSON-Objekt in geschweiften Klammern</translation>
     </message>
     <message>
         <source>a number from 1 to 8</source>
