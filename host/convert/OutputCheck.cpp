@@ -15,7 +15,6 @@
 #include <fmt/format.h>
 #include <memory>
 #include <optional>
-#include <set>
 #include <string_view>
 #include <sys/stat.h>
 #include <unistd.h>
@@ -30,7 +29,7 @@ bool SameFile(const struct stat& a, const struct stat& b) {
 }
 
 /// Refuses a file that the conversion would replace.
-void CheckTarget(const std::string& path, const struct stat* input, const Request& request) {
+void CheckTarget(const std::string& path, const Request& request) {
     struct stat target {};
     if (stat(path.c_str(), &target) != 0) {
         if (lstat(path.c_str(), &target) == 0) {
@@ -40,9 +39,9 @@ void CheckTarget(const std::string& path, const struct stat* input, const Reques
         }
         return;
     }
-    if (input != nullptr && SameFile(*input, target)) {
+    if (const char* role = WhatIsReadFrom(path, request)) {
         throw Failure(Category::kRequest,
-                      fmt::format("\"{}\" is the source itself; give the output another name", path));
+                      fmt::format("\"{}\" is {}; give the output another name", path, role));
     }
     if (S_ISDIR(target.st_mode))
         throw Failure(Category::kOutput, fmt::format("\"{}\" is a folder; name a file in it", path));
@@ -70,25 +69,15 @@ void CheckFolder(const std::string& folder) {
     }
 }
 
-/// The number of the clip of `output` that has this name; nothing when none has it.
-std::optional<std::size_t> ClipNumber(std::string_view name, std::string_view output) {
+/// The number of the clip of `output` that has that name.
+std::optional<int> ClipNumber(std::string_view name, std::string_view output) {
     const auto [base, extension] = text::SplitName(output);
-    std::size_t number = 0;
+    int number = 0;
     const char* digits = name.data() + std::min(base.size() + 1, name.size());
-    const bool isClip = std::from_chars(digits, name.data() + name.size(), number).ec == std::errc() &&
-                        name == text::ClipName(output, number);
-    return isClip ? std::optional(number) : std::nullopt;
-}
-
-/// The numbers of the clips of the output `name` that are in its folder. A folder that cannot be listed holds
-/// none as far as one can tell.
-std::set<std::size_t> ClipsIn(const std::string& folder, const std::string& name) {
-    std::set<std::size_t> numbers;
-    const std::unique_ptr<DIR, int (*)(DIR*)> listing(opendir(folder.c_str()), closedir);
-    while (const dirent* entry = listing ? readdir(listing.get()) : nullptr)
-        if (const std::optional<std::size_t> number = ClipNumber(entry->d_name, name))
-            numbers.insert(*number);
-    return numbers;
+    const bool isNumber = std::from_chars(digits, name.data() + name.size(), number).ec == std::errc();
+    return isNumber && number >= 0 && name == text::ClipName(output, static_cast<std::size_t>(number))
+               ? std::optional(number)
+               : std::nullopt;
 }
 
 /// The last clip's number; of a source of unknown length as if it lasted a day.
@@ -97,7 +86,7 @@ std::size_t LastClip(const Request& request) {
     return static_cast<std::size_t>(std::llround(request.length.value_or(kDay) / *request.split));
 }
 
-void CheckClips(const Request& request, const struct stat* input) {
+void CheckClips(const Request& request) {
     const std::string name = text::NameOf(request.output);
     const auto [base, extension] = text::SplitName(std::string_view(name));
     if (base.empty() || extension.empty()) {
@@ -114,8 +103,8 @@ void CheckClips(const Request& request, const struct stat* input) {
     }
     const std::string folder = text::FolderOf(request.output);
     CheckName(folder + "/" + text::ClipName(std::string_view(name), LastClip(request)));
-    for (const std::size_t number : ClipsIn(folder, name)) // the first one is what a refusal names
-        CheckTarget(folder + "/" + text::ClipName(std::string_view(name), number), input, request);
+    for (const auto& [number, clip] : ClipsOf(request.output))
+        CheckTarget(clip, request);
 }
 
 } // namespace
@@ -124,6 +113,32 @@ bool AreSame(const std::string& path, const std::string& other) {
     struct stat a {};
     struct stat b {};
     return stat(path.c_str(), &a) == 0 && stat(other.c_str(), &b) == 0 && SameFile(a, b);
+}
+
+std::map<int, std::string> ClipsOf(const std::string& output) {
+    const std::string name = text::NameOf(output);
+    const std::string folder = text::FolderOf(output);
+    std::map<int, std::string> clips;
+    const std::unique_ptr<DIR, int (*)(DIR*)> listing(opendir(folder.c_str()), closedir);
+    while (const dirent* entry = listing ? readdir(listing.get()) : nullptr)
+        if (const std::optional<int> number = ClipNumber(entry->d_name, name))
+            clips.emplace(*number, folder + "/" + entry->d_name);
+    return clips;
+}
+
+const char* WhatIsReadFrom(const std::string& path, const Request& request) {
+    if (AreSame(path, request.input))
+        return "the source itself";
+    const auto isPath = [&path](const SubtitleFileWish& wish) { return AreSame(path, wish.path); };
+    const bool isText = std::any_of(request.subtitleFiles.begin(), request.subtitleFiles.end(), isPath) ||
+                        AreSame(path, request.burnSubtitles);
+    return isText ? "a file of subtitles that is read" : nullptr;
+}
+
+void RemoveUnfinished(const std::string& output, const Request& request) {
+    const std::string left = output + text::PartialSuffix(1);
+    if (WhatIsReadFrom(left, request) == nullptr)
+        unlink(left.c_str());
 }
 
 bool IsOutput(const std::string& path, const Request& request) {
@@ -152,14 +167,12 @@ void CheckName(const std::string& path, const std::string& suffix) {
 }
 
 void CheckOutput(const Request& request) {
-    struct stat inputStatus {};
-    const struct stat* input = stat(request.input.c_str(), &inputStatus) == 0 ? &inputStatus : nullptr;
     CheckFolder(text::FolderOf(request.output));
     if (request.split) {
-        CheckClips(request, input);
+        CheckClips(request);
     } else {
         CheckName(request.output);
-        CheckTarget(request.output, input, request);
+        CheckTarget(request.output, request);
     }
 }
 

@@ -4,6 +4,7 @@
 
 #include "host/convert/Request.h"
 
+#include <map>
 #include <string>
 
 namespace movieconv {
@@ -16,6 +17,17 @@ void CheckOutput(const Request& request);
 /// Throws Failure when the file system of its folder cannot take the name. `suffix` is what it gets behind it
 /// for a while, if that is not shortened there.
 void CheckName(const std::string& path, const std::string& suffix = {});
+
+/// Whatever stands under the names of clips of `output`: their numbers and paths.
+std::map<int, std::string> ClipsOf(const std::string& output);
+
+/// What the conversion reads the file of that name as, "the source itself" or "a file of subtitles that is
+/// read"; null when it does not read it.
+const char* WhatIsReadFrom(const std::string& path, const Request& request);
+
+/// Removes what an earlier run has left of `output`, which has its name but was not completed. A file that
+/// the conversion reads stays.
+void RemoveUnfinished(const std::string& output, const Request& request);
 
 /// Whether both names stand for one file that exists.
 bool AreSame(const std::string& path, const std::string& other);

@@ -10,8 +10,8 @@
 #include <fmt/format.h>
 #include <map>
 #include <memory>
+#include <sys/stat.h>
 #include <thread>
-#include <unistd.h>
 #include <utility>
 
 namespace movieconv {
@@ -53,6 +53,29 @@ void Replace(std::string& text, const std::string& what, const std::string& by) 
         text.replace(at, what.size(), by);
 }
 
+/// Those that are no secret, sorted. What a link leads to counts, if it leads anywhere.
+std::vector<std::string> FilesIn(const std::string& folder) {
+    std::vector<std::string> found;
+    std::error_code error;
+    fs::directory_iterator entry(folder, error);
+    for (const fs::directory_iterator end; !error && entry != end; entry.increment(error)) {
+        std::error_code leadsNowhere;
+        if (entry->is_regular_file(leadsNowhere) && entry->path().filename().string().front() != '.')
+            found.push_back(entry->path().string());
+    }
+    if (error)
+        throw Failure(Category::kSource, fmt::format("cannot read \"{}\": {}", folder, error.message()));
+    std::sort(found.begin(), found.end());
+    return found;
+}
+
+/// What is written in the end, where a link stands under that name.
+std::string TargetOf(const std::string& output) {
+    std::error_code none;
+    const fs::path real = fs::canonical(output, none);
+    return none ? output : real.string();
+}
+
 /// Everything but the source that decides what comes out.
 std::string SettingsOf(Request request) {
     const std::vector<SourceMark> texts = MarkTexts(request);
@@ -73,6 +96,9 @@ public:
           source_(std::move(source)),
           settings_(settings) {}
 
+    void Opened(const OpenedFile& news) override {
+        journal_.NoteBegun(output_, source_, settings_, news.temporaryPath);
+    }
     void Closed(const ClosedFile& news) override { news_.Closed(news); }
     void LeftBehind(const NotCarried& news) override { news_.LeftBehind(news); }
     void Conclude(Verdict& verdict) override {
@@ -132,30 +158,31 @@ void Batch::List() {
         if (fs::equivalent(input, order_.folder, error))
             throw Failure(Category::kRequest,
                           fmt::format("\"{}\" is where the outputs go; choose another folder", input));
-        std::vector<std::string> found;
-        for (const auto& entry : fs::directory_iterator(input, error))
-            if (entry.is_regular_file(error) && entry.path().filename().string().front() != '.')
-                found.push_back(entry.path().string());
-        if (error)
-            throw Failure(Category::kSource, fmt::format("cannot read \"{}\": {}", input, error.message()));
-        std::sort(found.begin(), found.end());
-        for (const std::string& file : found)
+        for (const std::string& file : FilesIn(input))
             movies.push_back({file, OutputFor(file, extension), false});
     }
+    for (const Movie& movie : movies)
+        NoteSource(movie.input);
     std::map<std::string, std::string> taken;
     for (const Movie& movie : movies)
-        if (const auto [first, isNew] = taken.emplace(movie.output, movie.input); !isNew)
+        if (const auto [first, isNew] = taken.emplace(TargetOf(movie.output), movie.input); !isNew)
             throw Failure(Category::kRequest,
                           fmt::format("\"{}\" and \"{}\" would both become \"{}\"; choose other names",
-                                      first->second, movie.input, movie.output));
+                                      first->second, movie.input, first->first));
     waiting_.assign(movies.begin(), movies.end());
+}
+
+void Batch::NoteSource(const std::string& path) {
+    struct stat status {};
+    if (stat(path.c_str(), &status) == 0)
+        sources_.emplace(status.st_dev, status.st_ino);
 }
 
 std::string Batch::OutputFor(const std::string& input, const std::string& extension) const {
     std::string name = order_.names;
     Replace(name, "{ext}", extension);
     Replace(name, "{name}", fs::path(input).stem().string());
-    if (name.empty() || name.find('/') != std::string::npos)
+    if (name.empty() || name.find('/') != std::string::npos || name == BatchJournal::kName)
         throw Failure(Category::kRequest, fmt::format("\"{}\" makes no name of \"{}\"", order_.names, input));
     return order_.folder + "/" + name;
 }
@@ -176,6 +203,11 @@ std::optional<Crew::Assignment> Batch::Assign(const Movie& movie) {
     Request request = order_.request;
     request.input = movie.input;
     request.output = movie.output;
+    struct stat target {};
+    if (stat(movie.output.c_str(), &target) == 0 && sources_.count({target.st_dev, target.st_ino}) > 0)
+        throw Failure(
+            Category::kRequest,
+            fmt::format("its output \"{}\" is one of the sources; choose other names", movie.output));
     SourceMark source = MarkOf(movie.input);
     if (!movie.named && !IsMovie(request)) {
         ++skipped_;
@@ -189,8 +221,6 @@ std::optional<Crew::Assignment> Batch::Assign(const Movie& movie) {
         return std::nullopt;
     }
     request.overwrite = request.overwrite || state == BatchJournal::State::kBegun;
-    if (request.overwrite || access(movie.output.c_str(), F_OK) != 0) // else it will be refused
-        journal_->NoteBegun(movie.output, source, settings_);
     return Assignment{request, std::make_unique<MovieErrand>(News(), *journal_, movie.output,
                                                              std::move(source), settings_)};
 }

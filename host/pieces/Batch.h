@@ -7,7 +7,10 @@
 
 #include <deque>
 #include <optional>
+#include <set>
 #include <string>
+#include <sys/types.h>
+#include <utility>
 #include <vector>
 
 namespace movieconv {
@@ -27,6 +30,8 @@ public:
     ~Batch() override { Finish(); }
 
 private:
+    using FileId = std::pair<dev_t, ino_t>;
+
     struct Movie {
         std::string input;
         std::string output;
@@ -41,6 +46,7 @@ private:
     void Report() override;
 
     void List();
+    void NoteSource(const std::string& path);
     std::string OutputFor(const std::string& input, const std::string& extension) const;
     std::optional<Assignment> Assign(const Movie& movie);
     bool IsMovie(const Request& request);
@@ -53,7 +59,8 @@ private:
 
     // The batch's own thread's.
     std::deque<Movie> waiting_;
-    double converted_ = 0; // seconds, of movies that are done
+    std::set<FileId> sources_; // all that there were in the beginning
+    double converted_ = 0;     // seconds, of movies that are done
     int64_t bytes_ = 0;
     int count_ = 0;
     int done_ = 0;

@@ -3,17 +3,21 @@
 #include "host/convert/Failure.h"
 #include "host/pieces/CheckedLine.h"
 #include "host/pieces/Digest.h"
+#include "host/pieces/FileBirth.h"
 #include "host/pieces/WholeFile.h"
 #include "text/Path.h"
 
 #include <fmt/format.h>
 #include <sstream>
+#include <string_view>
+#include <sys/stat.h>
 #include <unistd.h>
 
 namespace movieconv {
 namespace {
 
 constexpr int64_t kLargestJournal = 256 << 20;
+constexpr std::string_view kLineHead = "{\"state\":"; // with which Note begins
 
 std::string HashOf(const SourceMark& mark) {
     return DigestOf(
@@ -26,9 +30,18 @@ std::string TaskOf(const SourceMark& source, const std::string& settings) {
 
 } // namespace
 
-BatchJournal::BatchJournal(const std::string& folder) : path_(folder + "/movieconv.journal") {
-    if (access(path_.c_str(), F_OK) == 0)
-        Read(ReadWhole(path_, kLargestJournal));
+BatchJournal::BatchJournal(const std::string& folder) : path_(folder + "/" + kName) {
+    struct stat status {};
+    if (lstat(path_.c_str(), &status) != 0)
+        return;
+    const std::string text = S_ISREG(status.st_mode) ? ReadWhole(path_, kLargestJournal) : std::string();
+    Read(text);
+    // Of a first line that a crash has cut there may be little.
+    const bool ours = !entries_.empty() || text.compare(0, kLineHead.size(), kLineHead, 0, text.size()) == 0;
+    if (!S_ISREG(status.st_mode) || !ours)
+        throw Failure(
+            Category::kOutput,
+            fmt::format("\"{}\" is no journal of conversions; choose another folder, or remove it", path_));
 }
 
 void BatchJournal::Read(const std::string& text) {
@@ -36,7 +49,10 @@ void BatchJournal::Read(const std::string& text) {
     for (std::string line; std::getline(lines, line);) {
         const std::optional<Json> entry = ObjectOn(line);
         const auto part = [&entry](const char* name) { return entry->at(name).get<std::string>(); };
-        if (entry)
+        const auto hasText = [&entry](const char* name) {
+            return entry->contains(name) && entry->at(name).is_string();
+        };
+        if (entry && hasText("output") && hasText("state") && hasText("task") && hasText("result"))
             entries_[part("output")] = {part("state") == "done", part("task"), part("result")};
         else if (!line.empty()) // see Note
             ++damaged_;
@@ -50,14 +66,17 @@ BatchJournal::State BatchJournal::StateOf(const std::string& output, const Sourc
     if (found == entries_.end() || found->second.task != TaskOf(source, settings))
         return State::kUnknown;
     if (!found->second.done)
-        return State::kBegun;
+        return BirthOf(output) == found->second.result ? State::kBegun : State::kUnknown;
     const bool stands = access(output.c_str(), F_OK) == 0 && HashOf(MarkOf(output)) == found->second.result;
     return stands ? State::kDone : State::kUnknown;
 }
 
-void BatchJournal::NoteBegun(const std::string& output, const SourceMark& source,
-                             const std::string& settings) {
-    Note(output, {false, TaskOf(source, settings), {}});
+void BatchJournal::NoteBegun(const std::string& output, const SourceMark& source, const std::string& settings,
+                             const std::string& temporary) {
+    std::string birth = BirthOf(temporary);
+    if (birth.empty()) // complete already
+        birth = BirthOf(output);
+    Note(output, {false, TaskOf(source, settings), birth});
 }
 
 void BatchJournal::NoteDone(const std::string& output, const SourceMark& source,

@@ -16,11 +16,13 @@ class BatchJournal {
 public:
     enum class State {
         kUnknown, ///< Nothing is known of the output.
-        kBegun,   ///< It was begun from this source with these settings, and its end is not known.
+        kBegun,   ///< It was begun from this source with these settings, and how that ended is not known.
         kDone,    ///< It was made of this source with these settings, and still stands there.
     };
 
-    /// Reads what is there. Throws Failure when it cannot be read.
+    static constexpr char kName[] = "movieconv.journal"; ///< In the folder.
+
+    /// Reads what is there. Throws Failure when it cannot be read, or is something else.
     explicit BatchJournal(const std::string& folder);
 
     /// Lines that were cut, edited or are of something else.
@@ -29,15 +31,17 @@ public:
     /// `settings` is what SettingsAsJson gives, as text.
     State StateOf(const std::string& output, const SourceMark& source, const std::string& settings) const;
 
-    /// Both throw Failure when the line cannot be written.
-    void NoteBegun(const std::string& output, const SourceMark& source, const std::string& settings);
+    /// Both throw Failure when the line cannot be written. `temporary` is the output's name until it is
+    /// complete: what stands under its own name later may be somebody else's.
+    void NoteBegun(const std::string& output, const SourceMark& source, const std::string& settings,
+                   const std::string& temporary);
     void NoteDone(const std::string& output, const SourceMark& source, const std::string& settings);
 
 private:
     struct Entry {
         bool done = false;
         std::string task;   ///< Hash of source and settings.
-        std::string result; ///< Hash of the output's mark, when it is done.
+        std::string result; ///< Hash of the output's mark when it is done, before that its BirthOf.
     };
 
     void Read(const std::string& text);

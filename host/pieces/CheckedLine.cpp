@@ -2,7 +2,18 @@
 
 #include "host/pieces/Digest.h"
 
+#include <stdexcept>
+
 namespace movieconv {
+
+Json ParseFlat(const std::string& text) {
+    constexpr int kDeepest = 32;
+    return Json::parse(text, [](int depth, Json::parse_event_t, const Json&) {
+        if (depth > kDeepest)
+            throw std::invalid_argument("it is nested too deep");
+        return true;
+    });
+}
 
 std::string AsText(const Json& json) {
     return json.dump(-1, ' ', false, Json::error_handler_t::replace);
@@ -14,11 +25,17 @@ std::string CheckedLine(Json object) {
 }
 
 std::optional<Json> ObjectOn(const std::string& line) {
-    Json object = Json::parse(line, nullptr, false);
-    if (!object.is_object())
+    try {
+        Json object = ParseFlat(line);
+        if (!object.is_object())
+            return std::nullopt;
+        object.erase("check");
+        return CheckedLine(object) == line + "\n" ? std::optional(object) : std::nullopt;
+    } catch (const Json::exception&) {
         return std::nullopt;
-    object.erase("check");
-    return CheckedLine(object) == line + "\n" ? std::optional(object) : std::nullopt;
+    } catch (const std::invalid_argument&) {
+        return std::nullopt;
+    }
 }
 
 } // namespace movieconv

@@ -9,6 +9,10 @@
 
 namespace movieconv {
 
+/// Throws Json::exception when it is no JSON, and std::invalid_argument when it is nested deeper than
+/// anything that is written here: who copies or prints such a value may run out of stack.
+Json ParseFlat(const std::string& text);
+
 /// On one line, without its end. What is no UTF-8 is replaced.
 std::string AsText(const Json& json);
 

@@ -2,9 +2,11 @@
 
 #include "host/convert/Failure.h"
 #include "host/pieces/CheckedLine.h"
+#include "host/pieces/FileBirth.h"
 #include "host/pieces/WholeFile.h"
 #include "text/Path.h"
 
+#include <algorithm>
 #include <filesystem>
 #include <fmt/format.h>
 #include <sstream>
@@ -24,12 +26,39 @@ Json MarkOfClip(const std::string& path) {
     return mark;
 }
 
+std::string FirstLine(const std::string& text) {
+    return text.substr(0, text.find('\n'));
+}
+
+bool IsHeader(const std::optional<Json>& line) {
+    const auto isObject = [&line](const char* part) {
+        return line->contains(part) && line->at(part).is_object();
+    };
+    return line && line->value("version", Json()) == kClipListVersion && isObject("madeWith") &&
+           isObject("source") && isObject("settings");
+}
+
 } // namespace
 
 ClipJournal::ClipJournal(const Request& request) : request_(request), path_(request.output + ".clips") {}
 
 bool ClipJournal::Exists() const {
     return access(path_.c_str(), F_OK) == 0;
+}
+
+void ClipJournal::RequirePlace() const {
+    const auto isList = [this] {
+        try {
+            return IsHeader(ObjectOn(FirstLine(ReadWhole(path_, kLargestClipList))));
+        } catch (const Failure&) {
+            return false;
+        }
+    };
+    if (Exists() && !isList())
+        throw Failure(Category::kOutput,
+                      fmt::format("the list of clips would replace another file, \"{}\"; give "
+                                  "the output another name, or remove that file",
+                                  path_));
 }
 
 bool ClipJournal::IsPossible() const {
@@ -56,7 +85,7 @@ std::optional<ClipStart> ClipJournal::Leftover() {
     std::string line;
     std::getline(lines, line);
     const std::optional<Json> header = ObjectOn(line);
-    if (!header || header->value("version", 0) != kClipListVersion)
+    if (!IsHeader(header))
         throw Failure(Category::kRequest, fmt::format("\"{}\" is damaged, or no list of clips", path_),
                       Reason::kCannotResume);
     const Json now = Json::parse(Header());
@@ -66,22 +95,48 @@ std::optional<ClipStart> ClipJournal::Leftover() {
                       Reason::kCannotResume);
     kept_ = line + "\n";
     std::optional<ClipStart> next;
+    bool follows = true;
     while (std::getline(lines, line)) {
-        const std::optional<Json> entry = ObjectOn(line);
-        if (!entry || !IsFinished(*entry))
-            break;
-        kept_ += line + "\n";
-        next = ClipStart{entry->at("next").get<int>(), entry->at("begin").get<int64_t>()};
+        const std::optional<Entry> entry = EntryOn(line);
+        follows = follows && entry && IsFinished(*entry);
+        if (follows) {
+            kept_ += line + "\n";
+            next = entry->next;
+        } else if (entry) {
+            further_.push_back(*entry);
+        }
+        if (entry)
+            births_.insert(entry->opened);
     }
     return next;
 }
 
+bool ClipJournal::IsOurs(const std::string& clip) const {
+    return births_.count(BirthOf(clip)) > 0 ||
+           std::any_of(further_.begin(), further_.end(), [&](const Entry& entry) {
+               return entry.clip == text::NameOf(clip) && MarkOfClip(clip) == entry.mark;
+           });
+}
+
+std::optional<ClipJournal::Entry> ClipJournal::EntryOn(const std::string& line) {
+    const std::optional<Json> json = ObjectOn(line);
+    try {
+        if (json && json->at("next").get<int>() > 0)
+            return Entry{json->at("clip").get<std::string>(),
+                         json->at("mark"),
+                         {json->at("next").get<int>(), json->at("begin").get<int64_t>()},
+                         json->value("opened", "")};
+    } catch (const Json::exception&) { // of another kind
+    }
+    return std::nullopt;
+}
+
 /// Whether the clip stands there as it was finished.
-bool ClipJournal::IsFinished(const Json& entry) const {
-    const std::string clip = text::FolderOf(request_.output) + "/" + entry.at("clip").get<std::string>();
+bool ClipJournal::IsFinished(const Entry& entry) const {
+    const std::string clip = text::FolderOf(request_.output) + "/" + entry.clip;
     if (access(clip.c_str(), F_OK) != 0)
         return false;
-    if (MarkOfClip(clip) == entry.at("mark"))
+    if (MarkOfClip(clip) == entry.mark)
         return true;
     if (request_.overwrite)
         return false;
@@ -93,11 +148,12 @@ void ClipJournal::Begin() {
     WriteWhole(path_, kept_.empty() ? Header() : kept_);
 }
 
-void ClipJournal::NoteFinished(const std::string& clip, ClipStart next) {
+void ClipJournal::NoteFinished(const std::string& clip, ClipStart next, const std::string& opened) {
     AppendWhole(path_, CheckedLine({{"clip", text::NameOf(clip)},
                                     {"mark", MarkOfClip(clip)},
                                     {"next", next.number},
-                                    {"begin", next.begin}}));
+                                    {"begin", next.begin},
+                                    {"opened", opened}}));
 }
 
 void ClipJournal::Remove() const {

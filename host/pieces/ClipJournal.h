@@ -7,7 +7,9 @@
 
 #include <cstdint>
 #include <optional>
+#include <set>
 #include <string>
+#include <vector>
 
 namespace movieconv {
 
@@ -21,6 +23,9 @@ public:
     const std::string& Path() const { return path_; }
     bool Exists() const;
 
+    /// Throws Failure when something else stands in the journal's place.
+    void RequirePlace() const;
+
     /// Whether it can be told later that the source is still the same: not of pipes and playlists.
     bool IsPossible() const;
 
@@ -32,18 +37,33 @@ public:
     /// Writes what is to be gone on with, or begins anew. Throws Failure, as NoteFinished does.
     void Begin();
 
-    /// The clip before `next` is finished, in that file. Lastingly.
-    void NoteFinished(const std::string& clip, ClipStart next);
+    /// Whether a clip that stands there is of the run that Leftover found, which listed it further on or was
+    /// just completing it, and not somebody else's.
+    bool IsOurs(const std::string& clip) const;
+
+    /// The clip before `next` is finished, in that file; `opened` is BirthOf the next one. Lastingly.
+    void NoteFinished(const std::string& clip, ClipStart next, const std::string& opened);
 
     void Remove() const;
 
 private:
     std::string Header() const;
-    bool IsFinished(const Json& entry) const;
+    struct Entry {
+        std::string clip; ///< Its name.
+        Json mark;
+        ClipStart next;
+        std::string opened; ///< BirthOf the clip behind it, which was being written then.
+    };
+
+    static std::optional<Entry> EntryOn(const std::string& line);
+    bool IsFinished(const Entry& entry) const;
 
     const Request request_;
     const std::string path_;
-    std::string kept_; // the lines of the journal that was found, up to the clip to go on with
+    // Of the journal that was found:
+    std::string kept_;             // the lines up to the clip to go on with
+    std::vector<Entry> further_;   // what else it lists
+    std::set<std::string> births_; // of clips that were being written
 };
 
 } // namespace movieconv

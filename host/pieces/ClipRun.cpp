@@ -2,12 +2,12 @@
 
 #include "host/convert/Failure.h"
 #include "host/convert/OutputCheck.h"
+#include "host/pieces/FileBirth.h"
 #include "text/FileNames.h"
 
 #include <fmt/format.h>
 #include <string>
 #include <string_view>
-#include <unistd.h>
 #include <utility>
 
 namespace movieconv {
@@ -25,11 +25,13 @@ void ClipRun::Prepare() {
                       fmt::format("\"{}\" is a playlist, a pipe or a device: whether it is still the same "
                                   "cannot be told, so clips of it cannot be gone on with",
                                   request_.input));
+    if (keeps_)
+        journal_.RequirePlace();
     if (resume_)
         request_.firstClip = journal_.Leftover();
     worth_ = request_.firstClip.has_value();
-    // Clips from there on are of the same conversion, which would have replaced no others.
-    request_.overwrite = request_.overwrite || worth_;
+    if (worth_)
+        TakeOver();
     isLeft_ = !worth_ && journal_.Exists();
     try {
         CheckOutput(request_);
@@ -43,11 +45,19 @@ void ClipRun::Prepare() {
     }
 }
 
+/// Clips of the run that broke off are replaced, and nothing else that has come there meanwhile.
+void ClipRun::TakeOver() {
+    for (const auto& [number, clip] : ClipsOf(request_.output))
+        if (number >= request_.firstClip->number && !request_.overwrite && !journal_.IsOurs(clip))
+            throw Failure(Category::kOutput, fmt::format("\"{}\" exists", clip), Reason::kExists);
+    request_.overwrite = true;
+}
+
 void ClipRun::Start() {
     if (request_.firstClip) { // what the run that broke off left of it
         const auto number = static_cast<std::size_t>(request_.firstClip->number);
         const std::string clip = text::ClipName(std::string_view(request_.output), number);
-        unlink((clip + text::PartialSuffix(1)).c_str());
+        RemoveUnfinished(clip, request_);
     }
     job_->Start();
 }
@@ -86,7 +96,9 @@ void ClipRun::Opened(const OpenedFile& news) {
             journal_.Begin();
             begun_ = true;
         } else if (keeps_) {
-            journal_.NoteFinished(closed_, {news.number - 1, news.begin});
+            const std::string birth = BirthOf(news.temporaryPath);
+            journal_.NoteFinished(closed_, {news.number - 1, news.begin},
+                                  birth.empty() ? BirthOf(news.path) : birth);
             worth_ = true;
         }
     } catch (const Failure& failure) {

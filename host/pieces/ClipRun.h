@@ -26,6 +26,7 @@ public:
 
 private:
     void Prepare();
+    void TakeOver();
 
     // News of the conversion, on its thread.
     void Started(const struct Start& news) override;

@@ -35,6 +35,7 @@ public:
         const std::lock_guard lock(mutex_);
         latest_ = news;
     }
+    void Opened(const OpenedFile& news) override { errand_->Opened(news); }
     void Closed(const ClosedFile& news) override { errand_->Closed(news); }
     void Warned(const Warning& news) override { crew_.outlet_.Warned(news); }
     void LeftBehind(const NotCarried& news) override { errand_->LeftBehind(news); }

@@ -49,8 +49,10 @@ void RequirePlan(const std::string& path) {
     try {
         ReadPlan(path);
     } catch (const Failure& failure) {
-        throw Failure(Category::kOutput, "the plan would replace another file: " + failure.Text(),
-                      Reason::kExists);
+        throw Failure(Category::kOutput,
+                      fmt::format("the plan would replace another file: {}; give the output another name, or "
+                                  "remove that file",
+                                  failure.Text()));
     }
 }
 
@@ -151,6 +153,10 @@ std::optional<Plan> Foreman::Prepare() {
         return plan;
     }
     CheckOutput(*order_.request);
+    if (IsPieceOf(order_.planPath, order_.request->input))
+        throw Failure(Category::kRequest, fmt::format("\"{}\" has the name of a piece that is to be made; "
+                                                      "give the output another name",
+                                                      order_.request->input));
     Plan begun = BeginPlan(*order_.request, order_.division);
     if (std::optional<Plan> before = Leftover(begun))
         return before;
@@ -172,7 +178,7 @@ std::optional<Plan> Foreman::Leftover(const Plan& now) {
                           Reason::kCannotResume);
         return before;
     }
-    if (planned && !order_.replace)
+    if (planned) // nobody has named it, so leave to replace the output is none to replace this
         RequirePlan(order_.planPath);
     if (!order_.resume && (planned || pieces > 0)) {
         News().Warned({Warning::Kind::kLeftover,
@@ -302,7 +308,7 @@ void Foreman::ReportFinishing(double share) {
 void Foreman::JoinAll() {
     CheckAgainst(plan_); // pieces of what was changed meanwhile do not belong together
     if (order_.resume)   // what a killed joining left
-        unlink((plan_.output + text::PartialSuffix(1)).c_str());
+        RemoveUnfinished(plan_.output, *order_.request);
     ReportFinishing(0);
     double told = 0;
     Verdict joined = JoinPieces(plan_, order_.planPath, order_.replace, News(), [&](double share) {

@@ -130,6 +130,14 @@ std::string FaultOf(const Plan& plan, const std::string& planPath, int number) {
     return {};
 }
 
+bool IsPieceOf(const std::string& planPath, const std::string& file) {
+    const auto files = FilesOf(planPath);
+    std::error_code ignored;
+    return std::any_of(files.begin(), files.end(), [&](const std::filesystem::path& piece) {
+        return std::filesystem::equivalent(piece, file, ignored);
+    });
+}
+
 int CountPieces(const std::string& planPath) {
     const auto files = FilesOf(planPath);
     return static_cast<int>(std::count_if(files.begin(), files.end(), [](const std::filesystem::path& file) {

@@ -28,6 +28,9 @@ std::string FaultOf(const Plan& plan, const std::string& planPath, int number);
 /// Whether there is a file of that name at all.
 bool PieceExists(const std::string& planPath, int number);
 
+/// Whether a file that exists has the place of a piece of a plan of that name.
+bool IsPieceOf(const std::string& planPath, const std::string& file);
+
 /// How many pieces stand beside a plan's name, whosever they are.
 int CountPieces(const std::string& planPath);
 

@@ -167,7 +167,7 @@ Plan PlanFrom(const Json& json) {
 Plan ReadPlan(const std::string& path) {
     const std::string text = ReadWhole(path, kLargestPlan);
     try {
-        return PlanFrom(Json::parse(text));
+        return PlanFrom(ParseFlat(text));
     } catch (const Json::parse_error&) {
         throw Failure(Category::kRequest, fmt::format("\"{}\" is not a plan, or only a part of one", path));
     } catch (const Json::exception& error) {

@@ -53,7 +53,8 @@ std::string ReadWhole(const std::string& path, int64_t most) {
 
 void WriteWhole(const std::string& path, std::string_view text) {
     const std::string making = NameInTheMaking(path);
-    Descriptor file(open(making.c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0666));
+    unlink(making.c_str()); // of a process that had the same number, or a link that somebody laid there
+    Descriptor file(open(making.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, 0666));
     const bool written = file.Number() >= 0 && text::WriteAll(file.Number(), text) &&
                          fsync(file.Number()) == 0 && file.Close() && RenameLastingly(making, path);
     if (written)
@@ -64,7 +65,8 @@ void WriteWhole(const std::string& path, std::string_view text) {
 }
 
 void AppendWhole(const std::string& path, std::string_view text) {
-    Descriptor file(open(path.c_str(), O_WRONLY | O_CREAT | O_APPEND | O_CLOEXEC, 0666));
+    Descriptor file(
+        open(path.c_str(), O_WRONLY | O_CREAT | O_APPEND | O_NOFOLLOW | O_NONBLOCK | O_CLOEXEC, 0666));
     if (file.Number() < 0 || !text::WriteAll(file.Number(), text) || fsync(file.Number()) != 0 ||
         !file.Close())
         throw CannotWrite(path);

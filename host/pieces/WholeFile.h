@@ -14,7 +14,8 @@ std::string ReadWhole(const std::string& path, int64_t most);
 /// Writes it beside and gives it the name, synced; what stood there is replaced. Throws Failure.
 void WriteWhole(const std::string& path, std::string_view text);
 
-/// Writes behind what a file holds, and to the disk; makes it when there is none. Throws Failure.
+/// Writes behind what a file holds, and to the disk; makes it when there is none. Throws Failure,
+/// also for a symbolic link and what is no file.
 void AppendWhole(const std::string& path, std::string_view text);
 
 /// Gives a synced file its name, lastingly. False, with errno set, when it fails.

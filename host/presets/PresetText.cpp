@@ -17,6 +17,7 @@ namespace movieconv {
 namespace {
 
 constexpr std::size_t kMostBytes = 1 << 20;
+constexpr std::size_t kDeepest = 32;
 
 /// Walks through a text and counts its lines.
 class CountingIterator {
@@ -82,7 +83,10 @@ public:
     }
 
 private:
+    /// What copies or prints values goes as deep as they are nested.
     bool Enter() {
+        if (path_.size() == kDeepest)
+            throw PresetError(fmt::format("{}:{}: this is nested too deep for a preset", where_, line_));
         path_.push_back(std::exchange(key_, ""));
         return true;
     }

@@ -5,34 +5,52 @@
 #include "host/terminal/Preview.h"
 #include "text/FileNames.h"
 
+#include <algorithm>
 #include <fmt/format.h>
+#include <optional>
+#include <string>
 
 namespace movieconv {
 namespace {
 
-void CheckSideFile(const char* option, const std::string& path, const Request& request) {
-    const char* other = AreSame(path, request.input)                         ? "the source"
-                        : !request.output.empty() && IsOutput(path, request) ? "the output or a part of it"
-                                                                             : nullptr;
+/// With --into, what stands in the output's place is an input, too.
+bool IsFurtherInput(const std::string& path, const Options& options) {
+    return options.into && (AreSame(path, options.request.output) ||
+                            std::any_of(options.further.begin(), options.further.end(),
+                                        [&](const std::string& input) { return AreSame(path, input); }));
+}
+
+void CheckSideFile(const char* option, const std::string& path, const Options& options) {
+    const Request& request = options.request;
+    const char* other = IsFurtherInput(path, options) ? "the source itself" : WhatIsReadFrom(path, request);
+    if (other == nullptr && !request.output.empty() && IsOutput(path, request))
+        other = "the output or a part of it";
     if (other != nullptr) {
         throw Failure(Category::kRequest,
                       fmt::format("{} \"{}\" is {}; give it another name", option, path, other));
     }
 }
 
+void CheckPair(const char* option, const std::optional<std::string>& path, const char* other,
+               const std::optional<std::string>& otherPath) {
+    if (path && otherPath && (*path == *otherPath || AreSame(*path, *otherPath)))
+        throw Failure(Category::kRequest, fmt::format("{} and {} name the same file", option, other));
+}
+
 } // namespace
 
 void CheckSideFiles(const Options& options) {
     if (options.log)
-        CheckSideFile("--log", *options.log, options.request);
+        CheckSideFile("--log", *options.log, options);
+    if (options.plan)
+        CheckSideFile("--plan", *options.plan, options);
     if (options.preview) {
-        CheckSideFile("--preview", *options.preview, options.request);
+        CheckSideFile("--preview", *options.preview, options);
         CheckName(*options.preview, text::PartialSuffix(text::kMostPartials));
         CheckPreview(*options.preview, options.request.overwrite);
     }
-    if (options.log && options.preview &&
-        (*options.log == *options.preview || AreSame(*options.log, *options.preview)))
-        throw Failure(Category::kRequest, "--log and --preview name the same file");
+    CheckPair("--log", options.log, "--preview", options.preview);
+    CheckPair("--log", options.log, "--plan", options.plan);
 }
 
 } // namespace movieconv

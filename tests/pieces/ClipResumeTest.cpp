@@ -124,6 +124,44 @@ TEST(ClipsLeft, ThatAreMissingOrListedOnADamagedLineAreMadeAgain) {
     }
 }
 
+// Whatever others have put under names that are to come.
+TEST(ClipsLeft, LeaveWhatIsNoneOfThem) {
+    const Killed killed;
+    WriteFile(killed.Clip(8), "precious");
+    const Result refused = killed.Resume();
+    EXPECT_EQ(refused.code, kCannotWrite);
+    EXPECT_TRUE(Has(refused.err, "out_08.mp4\" exists")) << refused.err;
+    EXPECT_EQ(ReadFile(killed.Clip(8)), "precious");
+    std::filesystem::remove(killed.Clip(8));
+    EXPECT_EQ(killed.Resume().code, 0);
+
+    const Folder folder;
+    const std::string list = folder / "out.mp4.clips";
+    WriteFile(list, "precious");
+    for (const char* leave : {"-q", "-y", "--resume"}) {
+        const Result result = Call({"-q", leave, "--split", "5", ClipSource(), folder / "out.mp4"});
+        EXPECT_EQ(result.code, kCannotWrite);
+        EXPECT_TRUE(Has(result.err, list)) << result.err;
+        EXPECT_EQ(ReadFile(list), "precious");
+    }
+}
+
+// What a kill has left is removed before a clip is made again, but not a movie that is converted.
+TEST(ClipsLeft, MayBeOfASourceThatIsCalledLikeTheNextOne) {
+    const Folder folder;
+    const std::string source = folder / "out_02.mp4.part";
+    const Args arguments{"--progress", "json", "--split", "2", source, folder / "out.mp4"};
+    while (!std::filesystem::exists(folder / "out.mp4.clips")) {
+        WriteFile(source, ReadFile(ClipSource()));
+        Running run(Join(arguments, Args{"-y"}), false);
+        EXPECT_TRUE(run.WaitFor(R"("event":"clip_opened".*_02\.mp4)"));
+        run.Signal(SIGKILL);
+        run.Finish();
+    }
+    EXPECT_EQ(Call(Join(arguments, Args{"--resume"})).code, 0);
+    EXPECT_TRUE(ReadFile(source) == ReadFile(ClipSource()));
+}
+
 TEST(ClipsLeft, OfAPipeAreNot) {
     const Folder folder;
     const std::string pipe = folder / "pipe.mkv";

@@ -7,6 +7,7 @@
 
 #include <filesystem>
 #include <string>
+#include <sys/stat.h>
 #include <vector>
 
 namespace {
@@ -94,9 +95,90 @@ TEST(ManyMovies, BelieveNoLineOfTheJournalThatWasEdited) {
     EXPECT_TRUE(Has(again.out, "in one file")) << "c.mp4 alone had to be made again: " << again.out;
 }
 
+// A journal is nobody else's file, however it came there, and holds nothing that could do harm.
+TEST(ManyMovies, AreEnteredInNothingButAJournal) {
+    const Movies movies;
+    std::filesystem::create_directory(movies.out);
+    const std::string journal = movies.out + "/movieconv.journal";
+    const std::string precious = movies.folder / "precious";
+    WriteFile(precious, "precious");
+    const auto refuses = [&] {
+        const Result result = movies.Convert();
+        EXPECT_EQ(result.code, 4) << result.err;
+        EXPECT_TRUE(Has(result.err, "is no journal")) << result.err;
+        std::filesystem::remove(journal);
+    };
+    std::filesystem::create_symlink(precious, journal);
+    refuses();
+    std::filesystem::create_symlink(movies.folder / "nowhere", journal);
+    refuses();
+    ASSERT_EQ(mkfifo(journal.c_str(), 0600), 0);
+    refuses();
+    std::filesystem::copy_file(precious, journal);
+    EXPECT_EQ(movies.Convert().code, 4);
+    EXPECT_EQ(ReadFile(journal), "precious");
+    EXPECT_EQ(ReadFile(precious), "precious");
+    EXPECT_FALSE(std::filesystem::exists(movies.folder / "nowhere"));
+
+    WriteFile(journal, R"({"state":)" + std::string(1'000'000, '[') + std::string(1'000'000, ']') + "}\n");
+    const Result nested = movies.Convert();
+    EXPECT_EQ(nested.code, 0) << nested.err;
+    EXPECT_TRUE(Has(nested.err, "1 lines of the journal")) << nested.err;
+}
+
+TEST(ManyMovies, LeaveWhatOthersPutInThePlaceOfOneThatWasBegun) {
+    const Movies movies;
+    ASSERT_EQ(movies.Convert().code, 0);
+    const std::string journal = movies.out + "/movieconv.journal";
+    std::string text = ReadFile(journal);
+    const std::size_t end = text.rfind(R"({"state":"done")");
+    const std::size_t name = text.find(R"("output":")", end) + 10;
+    const std::string last = movies.out + "/" + text.substr(name, text.find('"', name) - name);
+    text.resize(end); // as a kill leaves it before the last line
+    WriteFile(journal, text);
+    const Result again = movies.Convert();
+    EXPECT_EQ(again.code, 0) << again.err;
+    EXPECT_TRUE(Has(again.out, "in one file")) << again.out;
+    WriteFile(journal, text);
+    std::filesystem::remove(last);
+    WriteFile(last, "precious");
+    EXPECT_EQ(movies.Convert().code, 4);
+    EXPECT_EQ(ReadFile(last), "precious");
+}
+
+TEST(ManyMovies, AreNotReplacedWhileTheyWait) {
+    const Movies movies;
+    const std::string in = movies.folder / "in";
+    for (const char* name : {"b.mkv", "notes.txt"})
+        std::filesystem::remove(in + "/" + name);
+    WriteFile(movies.folder / "a-small.mkv", ReadFile(Short())); // what a.mkv is to become
+    const Result result = Call({"--into", movies.folder.Path(), "--names", "{name}-small.mkv", "-f", "mkv",
+                                "-y", in, movies.folder / "a-small.mkv"});
+    EXPECT_EQ(result.code, 2) << result.err;
+    EXPECT_TRUE(Has(result.err, "is one of the sources")) << result.err;
+    EXPECT_TRUE(ReadFile(movies.folder / "a-small.mkv") == ReadFile(Short()));
+    EXPECT_TRUE(std::filesystem::exists(movies.folder / "a-small-small.mkv"));
+}
+
+TEST(ManyMovies, OfAFolderAreFoundBesideLinksThatLeadNowhere) {
+    const Movies movies;
+    for (int link = 0; link < 20; ++link) // one of which the system tells last
+        std::filesystem::create_symlink("nowhere", movies.folder / ("in/link" + std::to_string(link)));
+    std::filesystem::create_symlink("loop", movies.folder / "in/loop");
+    const Result result = movies.Convert();
+    EXPECT_EQ(result.code, 0) << result.err;
+    EXPECT_TRUE(Has(result.out, "in 3 files")) << result.out;
+}
+
 TEST(ManyMovies, NeedNamesOfTheirOwn) {
     const Movies movies;
+    EXPECT_EQ(movies.Convert({"--names", "movieconv.journal", "-f", "mp4", "-y"}).code, 2);
     EXPECT_EQ(movies.Convert({"--names", "same.mp4"}).code, 2);
+    std::filesystem::create_directory(movies.out);
+    WriteFile(movies.out + "/b.mp4", "precious");
+    std::filesystem::create_symlink("b.mp4", movies.out + "/a.mp4");
+    EXPECT_EQ(movies.Convert({"-y"}).code, 2);
+    EXPECT_EQ(ReadFile(movies.out + "/b.mp4"), "precious");
     EXPECT_EQ(Call({"--into", movies.folder / "in", movies.folder / "in"}).code, 2);
     EXPECT_EQ(Call({"--into", movies.out, "--split", "2", movies.folder / "c.mkv"}).code, 2);
     EXPECT_EQ(Call({movies.folder / "c.mkv", movies.folder / "d.mp4", movies.folder / "in/a.mkv"}).code, 2);

@@ -225,8 +225,44 @@ TEST(Pieces, NeverReplaceAnOutputWithoutLeave) {
 
     const std::string other = farm.folder / "other.mp4";
     WriteFile(other + ".plan", "precious");
-    EXPECT_EQ(Call({"-q", "--jobs", "1", Source(), other}).code, kCannotWrite);
-    EXPECT_EQ(ReadFile(other + ".plan"), "precious");
+    for (const char* leave : {"-q", "-y", "--resume"}) { // which is one to replace the output
+        EXPECT_NE(Call({"-q", leave, "--jobs", "1", Source(), other}).code, 0);
+        EXPECT_EQ(ReadFile(other + ".plan"), "precious");
+    }
+}
+
+// Names that conversions in pieces and clips use for themselves.
+TEST(Pieces, LeaveTheirSourceWhateverItIsCalled) {
+    const Folder folder;
+    const std::string output = folder / "out.mp4";
+    const struct {
+        const char* name;
+        Args options;
+        int code;
+    } cases[] = {{".part", {"--jobs", "1", "--resume"}, 0},
+                 {".plan", {"--jobs", "1", "-y"}, kCannotWrite},
+                 {".plan.0000.piece", {"--jobs", "1", "-y"}, kUsage},
+                 {".clips", {"--split", "4", "-y"}, kCannotWrite}};
+    for (const auto& test : cases) {
+        const std::string source = output + test.name;
+        WriteFile(source, ReadFile(Source()));
+        const Result result = Call(test_movies::Join(Args{"-q", source, output}, test.options));
+        EXPECT_EQ(result.code, test.code) << test.name << result.err;
+        EXPECT_TRUE(ReadFile(source) == ReadFile(Source())) << test.name;
+        std::filesystem::remove(source);
+        std::filesystem::remove(output);
+    }
+    EXPECT_TRUE(folder.Names().empty());
+}
+
+// Values that are nested very deep take the stack of whoever copies or prints them.
+TEST(Pieces, OfAPlanThatIsNestedWithoutEndAreRefused) {
+    const Folder folder;
+    const std::string plan = folder / "movie.plan";
+    WriteFile(plan, "{\"version\":" + std::string(1'000'000, '[') + std::string(1'000'000, ']') + "}");
+    const Result result = Call({"--piece", "0", plan});
+    EXPECT_EQ(result.code, kUsage) << result.err;
+    EXPECT_TRUE(Has(result.err, "is nested too deep")) << result.err;
 }
 
 /// A source whose pieces take long enough to be met at work.

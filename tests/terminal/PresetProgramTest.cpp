@@ -206,6 +206,10 @@ TEST(ProgramPresets, AreListedShownAndRefused) {
     const std::string own = folder / "movieconv/presets/";
     fs::create_directories(own);
     WriteFile(own + "mine.json", "{\n\"parent\": \"small\",\n\"colour\": \"blue\"\n}");
+    std::string deep; // whose levels have names, and so places of their own
+    for (int level = 0; level < 100'000; ++level)
+        deep += "{\"a\":";
+    WriteFile(folder / "deep.json", deep);
     WriteFile(own + "broken.json", "{\n\n\"video\": {\"speed\": 3}\n}");
     setenv("XDG_CONFIG_HOME", folder.Path().c_str(), 1);
     const std::string source = Grainy();
@@ -222,6 +226,7 @@ TEST(ProgramPresets, AreListedShownAndRefused) {
         {{"--show-preset", "mine"}, 0, "\"colour\": \"blue\"", "mine.json:3: there is no \"colour\""},
         {{"--show-preset", "nobody"}, 2, "", "no preset \"nobody\""},
         {{"--preset", "broken", source, output}, 2, "", own + "broken.json:3: \"video.speed\" has to be"},
+        {{"--preset", folder / "deep.json", source, output}, 2, "", "nested too deep"},
         {{"--preset", "none/at/all", source, output}, 2, "", "none/at/all"},
         {{"--preset", "archive", source, output}, 2, "", "cannot carry pictures as \"FFV1\""},
         {{"--preset", "classic", "--quality", "40", source, output}, 2, "", "from 1 (best) to 31"},
