@@ -76,7 +76,7 @@ Course::Course(const Request& request, Movie& movie, Wishes& wishes, Observer& o
         wishes.pictures.TakesHdr(*movie.Info().pictures);
 }
 
-Verdict Course::Run() {
+void Course::Prepare() {
     const bool lengthKnown = movie_.Info().certainty != Certainty::kGuessed;
     observer_.Started({request_.input, request_.output, length_, lengthKnown});
     if (!request_.piece || !request_.piece->pictures) {
@@ -95,6 +95,9 @@ Verdict Course::Run() {
         if (sizeIsKnown_)
             CheckKnownSize();
     }
+}
+
+Verdict Course::Run() {
     clock_.Skip(WorkClock::Now());
     if (request_.firstClip)
         RunClip();

@@ -44,6 +44,10 @@ public:
     Course(const Course&) = delete;
     Course& operator=(const Course&) = delete;
 
+    /// Tells what is to be converted and reads what has to be known of it before: files of subtitles, and of
+    /// the source. Throws Failure when that does not go, or was interrupted.
+    void Prepare();
+
     /// Converts and tells. Throws Failure when it cannot begin.
     Verdict Run();
 

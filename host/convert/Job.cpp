@@ -10,6 +10,7 @@
 
 #include <algorithm>
 #include <atomic>
+#include <exception>
 #include <mutex>
 #include <sys/resource.h>
 #include <thread>
@@ -41,7 +42,7 @@ public:
         thread_ = std::thread([this] { Run(); });
     }
 
-    /// The source is interrupted only while it is opened: afterwards it is the course that stops it.
+    /// Reading is interrupted only until the course runs: afterwards it is the course that stops it.
     void Stop() {
         Want(&Wishes::stop);
         const std::lock_guard lock(mutex_);
@@ -70,7 +71,7 @@ private:
     Outlet outlet_;
     Wishes wishes_;
     std::mutex mutex_;                      // guards this:
-    std::shared_ptr<Interruption> opening_; // null unless the source is being opened
+    std::shared_ptr<Interruption> opening_; // null unless the source is opened and looked at
     Ending ending_;
     std::thread thread_;
 };
@@ -93,13 +94,17 @@ Verdict Job::Impl::Convert() {
         if (wishes_.stop)
             return stopped;
         Movie movie = OpenMovie(request_, interruption);
+        if (wishes_.stop)
+            return stopped;
+        Course course(request_, movie, wishes_, outlet_);
+        course.Prepare();
         SetOpening(nullptr);
-        if (interruption->Interrupted())
+        if (wishes_.stop)
             return stopped;
         open = true;
-        return Course(request_, movie, wishes_, outlet_).Run();
-    } catch (const Failure&) {
-        if (open || !interruption->Interrupted())
+        return course.Run();
+    } catch (const std::exception&) {
+        if (open || !wishes_.stop)
             throw;
         return stopped;
     }

@@ -64,9 +64,9 @@ void ReadStream(CueList& list, const Source& source, const BurnWish& wish, bool 
     }
 }
 
-void ReadFile(CueList& list, const BurnWish& wish) {
+void ReadFile(CueList& list, const Source& source, const BurnWish& wish) {
     try {
-        SubtitleFile file(wish.what, wish.charset);
+        SubtitleFile file(wish.what, wish.charset, source.Reader().Interruptible());
         const AVStream& stream = file.Stream();
         CheckDecodable(*stream.codecpar, wish);
         list.parameters = CopyOf(*stream.codecpar);
@@ -101,7 +101,7 @@ CueList ReadCues(const Source& source, const BurnWish& wish, bool playlists) {
     if (NamesStream(wish))
         ReadStream(list, source, wish, playlists);
     else
-        ReadFile(list, wish);
+        ReadFile(list, source, wish);
     std::stable_sort(
         list.cues.begin(), list.cues.end(),
         [](const CueList::Cue& one, const CueList::Cue& other) { return one.begin < other.begin; });

@@ -98,7 +98,7 @@ const AVCodecParameters& Movie::DescribeCopied(CopiedSound& sound) {
 
 BesidePackets& Movie::ReadSubtitleFile(const std::string& path, const std::string& charset,
                                        const AVStream*& stream) {
-    subtitleFiles_.push_back(std::make_unique<SubtitleFile>(path, charset));
+    subtitleFiles_.push_back(std::make_unique<SubtitleFile>(path, charset, source_.Reader().Interruptible()));
     SubtitleFile& file = *subtitleFiles_.back();
     stream = &file.Stream();
     auto track =

@@ -1,16 +1,15 @@
 #include "host/source/SubtitleFile.h"
 
+#include "host/source/InputFile.h"
 #include "host/source/SourceError.h"
 
 #include <algorithm>
 #include <cerrno>
 #include <cstdio>
-#include <cstring>
 #include <fmt/format.h>
-#include <fstream>
 #include <iconv.h>
-#include <iterator>
 #include <string_view>
+#include <system_error>
 #include <utility>
 
 namespace movieconv {
@@ -20,20 +19,24 @@ constexpr char kTexts[] =
     "ass,jacosub,lrc,microdvd,mpl2,mpsub,pjs,realtext,sami,srt,stl,subviewer,subviewer1,vplayer,"
     "webvtt";
 
-std::string ReadWhole(const std::string& path) {
+std::string ReadWhole(const std::string& path, const std::shared_ptr<const Interruption>& interruption) {
     constexpr std::size_t kMost = std::size_t{64} << 20;
-    std::ifstream file(path, std::ios::binary);
-    if (!file)
-        throw SourceError(fmt::format("cannot open \"{}\": {}", path, std::strerror(errno)));
-    std::string text;
-    std::string part(65536, '\0');
-    while (text.size() <= kMost &&
-           (file.read(part.data(), static_cast<std::streamsize>(part.size())), file.gcount() > 0))
-        text.append(part, 0, static_cast<std::size_t>(file.gcount()));
-    if (file.bad() || text.size() > kMost)
-        throw SourceError(fmt::format("cannot read \"{}\": {}", path,
-                                      file.bad() ? "input failed" : "it is too large for subtitles"));
-    return text;
+    constexpr int kPart = 65536;
+    try {
+        const InputFile file(path, Growth::kRead, interruption);
+        std::string text;
+        std::vector<unsigned char> part(kPart);
+        int count = 0;
+        while (text.size() <= kMost && (count = avio_read(file.Io(), part.data(), kPart)) > 0)
+            text.append(reinterpret_cast<const char*>(part.data()), static_cast<std::size_t>(count));
+        if (text.size() > kMost)
+            throw SourceError("it is too large for subtitles");
+        if (file.Io()->error < 0)
+            throw SourceError(av::ErrorText(file.Io()->error));
+        return text;
+    } catch (const std::system_error& error) {
+        throw SourceError(fmt::format("cannot open \"{}\": {}", path, error.code().message()));
+    }
 }
 
 /// Nothing when the text is none in that character set.
@@ -97,12 +100,13 @@ bool MakeUtf8(AVPacket& packet) {
     return true;
 }
 
-SubtitleFile::SubtitleFile(const std::string& path, const std::string& charset) {
+SubtitleFile::SubtitleFile(const std::string& path, const std::string& charset,
+                           const std::shared_ptr<const Interruption>& interruption) {
     const auto refuse = [&](const std::string& reason) {
         throw SourceError(fmt::format("cannot read subtitles from \"{}\": {}", path, reason));
     };
     try {
-        text_ = ToUtf8(ReadWhole(path), charset);
+        text_ = ToUtf8(ReadWhole(path, interruption), charset);
     } catch (const SourceError& error) {
         refuse(error.what());
     }

@@ -4,8 +4,10 @@
 
 #include "ffmpeg/AvHandles.h"
 #include "host/source/Demuxer.h"
+#include "host/source/Interruption.h"
 
 #include <cstdint>
+#include <memory>
 #include <string>
 #include <vector>
 
@@ -26,8 +28,9 @@ bool MakeUtf8(AVPacket& packet);
 class SubtitleFile {
 public:
     /// Reads `path`, in `charset`, see ToUtf8. Throws SourceError when it cannot be read or is not text with
-    /// subtitles.
-    SubtitleFile(const std::string& path, const std::string& charset);
+    /// subtitles; of a pipe as much comes as is written into it.
+    SubtitleFile(const std::string& path, const std::string& charset,
+                 const std::shared_ptr<const Interruption>& interruption = std::make_shared<Interruption>());
     SubtitleFile(const SubtitleFile&) = delete;
     SubtitleFile& operator=(const SubtitleFile&) = delete;
 
