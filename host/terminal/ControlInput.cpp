@@ -1,5 +1,6 @@
 #include "host/terminal/ControlInput.h"
 
+#include "text/Printable.h"
 #include "text/WriteAll.h"
 
 #include <array>
@@ -33,7 +34,7 @@ bool IsIgnored(int signal) {
 sigset_t OurSignals() {
     sigset_t set;
     sigemptyset(&set);
-    for (const int signal : {SIGINT, SIGTERM, SIGHUP, SIGTSTP})
+    for (const int signal : {SIGINT, SIGTERM, SIGHUP, SIGQUIT, SIGTSTP})
         if (!IsIgnored(signal))
             sigaddset(&set, signal);
     return set;
@@ -147,7 +148,7 @@ void ControlInput::TakeSignal(int signal, Clock::time_point now) {
         Suspend();
     } else if (signal == SIGTSTP) {
         Post(Command::kSuspend);
-    } else if (!armed_ || (stopAsked_ && now - *stopAsked_ >= kSameRequest)) {
+    } else if (!armed_ || signal == SIGQUIT || (stopAsked_ && now - *stopAsked_ >= kSameRequest)) {
         LeaveAtOnce(signal);
     } else if (!stopAsked_) {
         stopAsked_ = now;
@@ -176,9 +177,9 @@ void ControlInput::LeaveAtOnce(int signal) {
     try {
         const std::lock_guard lock(fileMutex_);
         if (!file_.empty())
-            text::WriteAll(
-                STDERR_FILENO,
-                fmt::format("\nmovieconv: left at once; what was written so far is in \"{}\"\n", file_));
+            text::WriteAll(STDERR_FILENO,
+                           fmt::format("\nmovieconv: left at once; what was written so far is in \"{}\"\n",
+                                       text::Printable(file_)));
     } catch (const std::bad_alloc&) { // leaving matters more than the message
     }
     // Ends as if the signal had not been caught, which the shell shows as 128 plus its number.

@@ -1,7 +1,9 @@
 #include "host/terminal/Describe.h"
 
 #include "host/convert/Amounts.h"
+#include "text/Printable.h"
 
+#include <algorithm>
 #include <cmath>
 #include <fmt/format.h>
 #include <string_view>
@@ -99,7 +101,7 @@ std::string DescribeStream(const StreamInfo& stream, Certainty certainty) {
                                                                : 0;
     if (length > 0)
         text += fmt::format(", length {}", DescribeLength(length, certainty));
-    return text +
+    return text::Printable(text) +
            (stream.decodable || stream.kind == StreamKind::kAttachment || stream.kind == StreamKind::kData
                 ? "\n"
                 : ", no decoder\n");
@@ -112,21 +114,35 @@ std::string DescribeConverted(const SourceInfo& source) {
     return fmt::format("pictures:  {}\nsound:     {}\n", number(source.pictures), number(source.sound));
 }
 
+/// Lines but for the first one stand further right than any others, so that they are not taken for these.
+std::string Indented(const std::string& lines) {
+    std::string text;
+    for (std::size_t begin = 0; begin <= lines.size();) {
+        const std::size_t end = std::min(lines.find('\n', begin), lines.size());
+        const bool windows = end > begin && lines[end - 1] == '\r';
+        text += begin == 0 ? "" : "\n          ";
+        text += text::Printable(std::string_view(lines).substr(begin, end - begin - (windows ? 1 : 0)));
+        begin = end + 1;
+    }
+    return text;
+}
+
 } // namespace
 
 std::string Describe(const SourceInfo& source) {
-    std::string text = fmt::format("file:      {} ({})\ncontainer: {}\nlength:    {}\n", source.path,
-                                   FormatBytes(source.bytes), source.container,
+    std::string text = fmt::format("file:      {} ({})\ncontainer: {}\nlength:    {}\n",
+                                   text::Printable(source.path), FormatBytes(source.bytes), source.container,
                                    DescribeLength(source.duration, source.certainty));
     text += DescribeConverted(source) + "streams:\n";
     for (const StreamInfo& stream : source.streams)
         text += DescribeStream(stream, source.certainty);
     text += source.chapters.empty() ? "" : "chapters:\n";
     for (const Chapter& chapter : source.chapters)
-        text += fmt::format("      {}  {}\n", FormatTime(chapter.begin, true), chapter.title);
+        text +=
+            fmt::format("      {}  {}\n", FormatTime(chapter.begin, true), text::Printable(chapter.title));
     text += source.tags.empty() ? "" : "tags:\n";
     for (const Tag& tag : source.tags)
-        text += fmt::format("      {}: {}\n", tag.key, tag.value);
+        text += fmt::format("      {}: {}\n", text::Printable(tag.key), Indented(tag.value));
     return text;
 }
 

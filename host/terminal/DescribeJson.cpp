@@ -127,7 +127,7 @@ std::string DescribeAsJson(const SourceInfo& source) {
                                       {"tags", TagsOf(chapter.tags)}});
     }
     object["tags"] = TagsOf(source.tags);
-    return object.dump(-1, ' ', false, Json::error_handler_t::replace) + "\n";
+    return EscapeCommands(object.dump(-1, ' ', false, Json::error_handler_t::replace)) + "\n";
 }
 
 } // namespace movieconv

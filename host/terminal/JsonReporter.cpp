@@ -1,5 +1,6 @@
 #include "host/terminal/JsonReporter.h"
 
+#include "text/Printable.h"
 #include "text/Utf8.h"
 
 #include <cmath>
@@ -30,6 +31,17 @@ std::string_view PhaseName(Phase phase) {
 
 } // namespace
 
+std::string EscapeCommands(std::string_view json) {
+    std::string escaped;
+    for (const wchar_t character : text::FromUtf8(json)) {
+        if (character >= 0x7F && text::IsCommand(character))
+            escaped += fmt::format("\\u{:04x}", static_cast<unsigned>(character));
+        else
+            escaped += text::ToUtf8({&character, 1});
+    }
+    return escaped;
+}
+
 std::string JsonString(std::string_view bytes) {
     std::wstring wide = text::FromUtf8(bytes);
     for (wchar_t& character : wide)
@@ -40,18 +52,18 @@ std::string JsonString(std::string_view bytes) {
         if (c == '"' || c == '\\') {
             quoted += '\\';
             quoted += c;
-        } else if (static_cast<unsigned char>(c) < 0x20 || c == 0x7F) {
+        } else if (static_cast<unsigned char>(c) < 0x20) {
             quoted += fmt::format("\\u{:04x}", static_cast<unsigned>(c));
         } else {
             quoted += c;
         }
     }
-    return quoted + '"';
+    return EscapeCommands(quoted + '"');
 }
 
 void JsonReporter::Print(std::string_view event, const std::string& fields) const {
-    streams_.Print(fmt::format("{{\"v\":{},\"event\":\"{}\"{}{}}}\n", kVersion, event,
-                               fields.empty() ? "" : ",", fields));
+    streams_.Report(fmt::format("{{\"v\":{},\"event\":\"{}\"{}{}}}\n", kVersion, event,
+                                fields.empty() ? "" : ",", fields));
 }
 
 void JsonReporter::Started(const Start& report) {
@@ -97,7 +109,7 @@ void JsonReporter::Warn(const std::string& text) {
 
 void JsonReporter::Error(const std::string& text) {
     Print("error", fmt::format("\"text\":{}", JsonString(text)));
-    streams_.PrintError(fmt::format("movieconv: error: {}\n", text));
+    streams_.PrintError(fmt::format("movieconv: error: {}", text));
 }
 
 void JsonReporter::End(const EndReport& report) {

@@ -32,6 +32,10 @@ private:
     double nextAt_ = 0; // seconds of work
 };
 
+/// The same JSON, with what terminals obey written as numbers. `json` has none of it but line ends outside of
+/// its strings.
+std::string EscapeCommands(std::string_view json);
+
 /// A JSON string with its quotes. Bytes that are not UTF-8 become U+FFFD.
 std::string JsonString(std::string_view bytes);
 

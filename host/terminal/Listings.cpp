@@ -3,6 +3,7 @@
 #include "host/convert/Formats.h"
 #include "host/presets/Preset.h"
 #include "media/MediaWriter.h"
+#include "text/Printable.h"
 
 #include <algorithm>
 #include <fmt/format.h>
@@ -77,9 +78,11 @@ std::string PresetsText() {
     std::string text;
     for (const PresetSummary& preset : ListPresets()) {
         const std::string& told = preset.failure.empty() ? preset.description : preset.failure;
-        fmt::format_to(std::back_inserter(text), "{:<10} {}{}\n", preset.name, told,
-                       preset.path.empty() || !preset.failure.empty() ? ""
-                                                                      : fmt::format(" ({})", preset.path));
+        fmt::format_to(std::back_inserter(text), "{:<10} {}{}\n", text::Printable(preset.name),
+                       text::Printable(told),
+                       preset.path.empty() || !preset.failure.empty()
+                           ? ""
+                           : fmt::format(" ({})", text::Printable(preset.path)));
     }
     return text;
 }

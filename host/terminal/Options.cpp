@@ -8,10 +8,13 @@
 #include "host/terminal/OptionTable.h"
 
 #include <CLI/CLI.hpp>
+#include <cerrno>
 #include <chrono>
 #include <cstdio>
 #include <cstdlib>
+#include <cstring>
 #include <fmt/format.h>
+#include <iostream>
 #include <utility>
 
 namespace movieconv {
@@ -51,6 +54,12 @@ std::string Version() {
     return text;
 }
 
+void RequirePrinted() {
+    if (!std::cout.flush() || std::fflush(stdout) != 0 || std::ferror(stdout) != 0)
+        throw Failure(Category::kOutput,
+                      fmt::format("cannot write to the standard output: {}", std::strerror(errno)));
+}
+
 } // namespace
 
 std::optional<Options> ParseOptions(int argc, char** argv) {
@@ -70,12 +79,14 @@ std::optional<Options> ParseOptions(int argc, char** argv) {
         app.parse(argc, argv);
     } catch (const CLI::Success& asked) {
         app.exit(asked);
+        RequirePrinted();
         return std::nullopt;
     } catch (const CLI::ParseError& error) {
         throw Failure(Category::kRequest, fmt::format("{}; try \"movieconv --help\"", error.what()));
     }
     if (options.completion) {
         std::fputs(CompletionScript(*options.completion, OptionEntries(app)).c_str(), stdout);
+        RequirePrinted();
         return std::nullopt;
     }
     if (options.request.input == "-")

@@ -85,11 +85,11 @@ void Session::Started(const Start& news) {
     started_ = true;
     if (options_.preview)
         preview_.emplace(*options_.preview, options_.request.overwrite);
-    reporter_->Started(news);
-    for (const std::string& complaint : options_.complaints)
-        reporter_->Warn(complaint);
     control_.Arm(options_.progress == ProgressStyle::kBar && !options_.quiet,
                  [this](Command command) { Obey(command); });
+    reporter_->Started(news); // whoever reads this may send signals
+    for (const std::string& complaint : options_.complaints)
+        reporter_->Warn(complaint);
 }
 
 void Session::Progressed(const Progress& news) {

@@ -4,6 +4,7 @@
 #include "host/convert/Failure.h"
 #include "host/terminal/SideFile.h"
 #include "logsink/LogSink.h"
+#include "text/Printable.h"
 #include "text/Utf8.h"
 #include "text/WriteAll.h"
 
@@ -77,8 +78,20 @@ int StandardStreams::OpenLog(const std::string& path, bool overwrite) {
     }
 }
 
-void StandardStreams::PrintError(std::string_view text) const {
-    Write(2, text);
+void StandardStreams::Report(std::string_view text) const {
+    if (lost_ || Print(text))
+        return;
+    lost_ = true;
+    PrintError(fmt::format("movieconv: warning: nothing more is told on the standard output: {}",
+                           std::strerror(errno)));
+}
+
+void StandardStreams::ReportLine(std::string_view line) const {
+    Report(text::Printable(line) + "\n");
+}
+
+void StandardStreams::PrintError(std::string_view line) const {
+    Write(2, text::Printable(line) + "\n");
 }
 
 bool StandardStreams::OutputIsTerminal() const {

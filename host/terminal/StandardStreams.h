@@ -22,8 +22,15 @@ public:
     /// false, with errno set, when the text is lost for another reason.
     bool Print(std::string_view text) const { return Write(output_, text); }
 
-    /// Writes to standard error.
-    void PrintError(std::string_view text) const;
+    /// Likewise, for what is told besides: a loss is told once on standard error, and nothing is written
+    /// after it, lest it be taken for the end of a line that was cut.
+    void Report(std::string_view text) const;
+
+    /// Reports a line, which is given without its end; what terminals obey in it is made visible.
+    void ReportLine(std::string_view line) const;
+
+    /// Writes a line to standard error, likewise.
+    void PrintError(std::string_view line) const;
 
     bool OutputIsTerminal() const;
 
@@ -35,6 +42,7 @@ private:
     static bool Write(int descriptor, std::string_view text);
 
     int output_;
+    mutable bool lost_ = false;
 };
 
 } // namespace movieconv

@@ -79,11 +79,11 @@ std::string ProgressText(const Progress& report, int columns) {
 }
 
 void QuietReporter::Error(const std::string& text) {
-    streams_.PrintError(fmt::format("movieconv: error: {}\n", text));
+    streams_.PrintError(fmt::format("movieconv: error: {}", text));
 }
 
 void SparseReporter::Warn(const std::string& text) {
-    Streams().PrintError(fmt::format("movieconv: warning: {}\n", text));
+    Streams().PrintError(fmt::format("movieconv: warning: {}", text));
 }
 
 void SparseReporter::LeftBehind(const NotCarried& report) {
@@ -95,17 +95,17 @@ void SparseReporter::LeftBehind(const NotCarried& report) {
         details = " (" + details + ")";
     LeaveLine();
     Streams().PrintError(
-        fmt::format("movieconv: not carried: {}{}{}: {}\n", report.kind, number, details, report.reason));
+        fmt::format("movieconv: not carried: {}{}{}: {}", report.kind, number, details, report.reason));
 }
 
 void SparseReporter::End(const EndReport& report) {
     if (!report.summary.empty())
-        Streams().Print(report.summary + "\n");
+        Streams().ReportLine(report.summary);
 }
 
 void LineReporter::Started(const Start& report) {
     const std::string length = report.lengthIsKnown ? FormatTime(report.length, true) : "length unknown";
-    Streams().Print(fmt::format("{} -> {} ({})\n", report.input, report.output, length));
+    Streams().ReportLine(fmt::format("{} -> {} ({})", report.input, report.output, length));
 }
 
 void LineReporter::Progressed(const Progress& report) {
@@ -116,13 +116,13 @@ void LineReporter::Progressed(const Progress& report) {
         return;
     nextAt_ = report.worked + kLineSeconds;
     constexpr int kAnyWidth = 1000;
-    Streams().Print(ProgressText(report, kAnyWidth) + "\n");
+    Streams().ReportLine(ProgressText(report, kAnyWidth));
 }
 
 void LineReporter::Closed(const ClosedFile& report) {
-    Streams().Print(fmt::format("wrote {} ({}, {})\n", report.path,
-                                FormatTime(std::max(report.videoSeconds, report.audioSeconds), true),
-                                FormatBytes(report.bytes)));
+    Streams().ReportLine(fmt::format("wrote {} ({}, {})", report.path,
+                                     FormatTime(std::max(report.videoSeconds, report.audioSeconds), true),
+                                     FormatBytes(report.bytes)));
 }
 
 void BarReporter::Progressed(const Progress& report) {
@@ -132,7 +132,7 @@ void BarReporter::Progressed(const Progress& report) {
         line = Bar(*report.percent) + line;
     const bool quietPhase = report.phase == Phase::kPaused || report.phase == Phase::kWaitingForRoom;
     const std::string colour = !colour_ ? "" : quietPhase ? "\x1b[33m" : "\x1b[32m";
-    Streams().Print(fmt::format("{}{}{}{}", kEraseLine, colour, line, colour_ ? "\x1b[0m" : ""));
+    Streams().Report(fmt::format("{}{}{}{}", kEraseLine, colour, line, colour_ ? "\x1b[0m" : ""));
     drawn_ = true;
 }
 
@@ -158,14 +158,14 @@ void BarReporter::End(const EndReport& report) {
 
 void BarReporter::LeaveLine() {
     if (drawn_) {
-        Streams().Print("\n");
+        Streams().Report("\n");
         drawn_ = false;
     }
 }
 
 void BarReporter::EraseLine() {
     if (drawn_) {
-        Streams().Print(kEraseLine);
+        Streams().Report(kEraseLine);
         drawn_ = false;
     }
 }

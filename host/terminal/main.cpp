@@ -5,12 +5,14 @@
 #include "host/presets/Preset.h"
 #include "host/terminal/ControlInput.h"
 #include "host/terminal/Describe.h"
+#include "host/terminal/JsonReporter.h"
 #include "host/terminal/Listings.h"
 #include "host/terminal/MainLoop.h"
 #include "host/terminal/Options.h"
 #include "host/terminal/Session.h"
 #include "host/terminal/SideFileCheck.h"
 #include "host/terminal/StandardStreams.h"
+#include "text/Printable.h"
 
 #include <cerrno>
 #include <cstdio>
@@ -66,7 +68,8 @@ ExitCode Estimate(const Options& options, const StandardStreams& streams) {
         throw Failure(Category::kOutput,
                       fmt::format("the output's folder \"{}\" cannot be used", room.folder));
     }
-    PrintWhole(streams, fmt::format("{} are free in \"{}\"\n", FormatBytes(room.free), room.folder));
+    PrintWhole(streams,
+               fmt::format("{} are free in \"{}\"\n", FormatBytes(room.free), text::Printable(room.folder)));
     return room.needed <= room.free ? ExitCode::kDone : ExitCode::kNoSpace;
 }
 
@@ -100,12 +103,12 @@ ExitCode WriteNewPlan(const Options& options, const StandardStreams& streams) {
     if (options.quiet)
         return ExitCode::kDone;
     for (const std::string& complaint : options.complaints)
-        streams.PrintError(fmt::format("movieconv: warning: {}\n", complaint));
+        streams.PrintError(fmt::format("movieconv: warning: {}", complaint));
     if (const std::string cost = TellBitRate(*plan); !cost.empty())
-        streams.PrintError(fmt::format("movieconv: warning: {}\n", cost));
+        streams.PrintError(fmt::format("movieconv: warning: {}", cost));
     PrintWhole(streams, fmt::format("{}: pieces 0 to {}, the last one is the sound and whatever else is "
                                     "carried\n",
-                                    path, plan->Pieces() - 1));
+                                    text::Printable(path), plan->Pieces() - 1));
     return ExitCode::kDone;
 }
 
@@ -114,8 +117,8 @@ std::string ShowPreset(const std::string& name, const StandardStreams& streams) 
     try {
         const Preset preset = LoadPreset(name);
         for (const std::string& complaint : preset.complaints)
-            streams.PrintError(fmt::format("movieconv: warning: {}\n", complaint));
-        return preset.text;
+            streams.PrintError(fmt::format("movieconv: warning: {}", complaint));
+        return EscapeCommands(preset.text);
     } catch (const PresetError& error) {
         throw Failure(Category::kRequest, error.what());
     }
@@ -164,7 +167,7 @@ int Main(int argc, char** argv) {
 
 void Tell(const Failure& failure) {
     try {
-        std::fprintf(stderr, "movieconv: error: %s\n", Explain(failure).c_str());
+        std::fprintf(stderr, "movieconv: error: %s\n", text::Printable(Explain(failure)).c_str());
     } catch (const std::bad_alloc&) {
         std::fprintf(stderr, "movieconv: error: there is not enough memory\n");
     }

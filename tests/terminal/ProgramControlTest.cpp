@@ -12,6 +12,7 @@
 #include <cstdlib>
 #include <fcntl.h>
 #include <filesystem>
+#include <sys/resource.h>
 #include <sys/stat.h>
 #include <thread>
 #include <unistd.h>
@@ -112,6 +113,22 @@ TEST(Program, FollowsKeysAndLeavesTheTerminalWhileItIsSuspended) {
     EXPECT_GT(LookAt(folder / "out.mp4").pictures.size(), 0u);
 }
 
+TEST(Program, LeavesTheTerminalAsItWasWhenItIsToldToQuitAtOnce) {
+    const Folder folder;
+    rlimit usual{};
+    getrlimit(RLIMIT_CORE, &usual);
+    const rlimit none{0, usual.rlim_max};
+    setrlimit(RLIMIT_CORE, &none);
+    Running running(Slowly(folder / "out.mp4"), true);
+    setrlimit(RLIMIT_CORE, &usual);
+    ASSERT_TRUE(running.WaitFor("left"));
+    EXPECT_FALSE(running.Echoes());
+    running.Press("\x1c"); // Ctrl-backslash
+    ASSERT_TRUE(running.WaitFor("what was written so far is in .*out.mp4.part"));
+    EXPECT_TRUE(running.Echoes());
+    EXPECT_EQ(running.Finish().code, 128 + SIGQUIT);
+}
+
 class ProgramStalls : public testing::TestWithParam<const char*> {};
 
 TEST_P(ProgramStalls, AndStops) {
@@ -136,6 +153,19 @@ TEST_P(ProgramStalls, AndStops) {
 }
 
 INSTANTIATE_TEST_SUITE_P(Begins, ProgramStalls, testing::Values("0", "6"));
+
+TEST(Program, StopsWhileAFileOfSubtitlesBringsNothing) {
+    const Folder folder;
+    ASSERT_EQ(mkfifo((folder / "pipe.srt").c_str(), 0600), 0);
+    Running running(
+        {CountedMovie(), folder / "out.mkv", "--subtitle-file", folder / "pipe.srt", "--progress", "json"},
+        false);
+    ASSERT_TRUE(running.WaitFor("\"event\":\"start\""));
+    running.Signal(SIGINT);
+    const Result result = running.Finish();
+    EXPECT_EQ(result.code, 6) << result.out;
+    EXPECT_EQ(folder.Names(), Args{"pipe.srt"});
+}
 
 TEST(Program, WritesTheSameFileWhateverThePauses) {
     const Folder folder;

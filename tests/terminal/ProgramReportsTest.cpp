@@ -4,9 +4,11 @@
 #include "tests/support/SmallDisk.h"
 #include "tests/support/TestMovies.h"
 #include "tests/terminal/Slowly.h"
+#include "text/Utf8.h"
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <csignal>
 #include <filesystem>
 
@@ -54,6 +56,19 @@ TEST(Program, RefusesAndLeavesEverythingAsItWas) {
         {{source, folder / "out.mkv", "--log", folder / "there.mp4"}, 4, "not a log"},
         {{"--list-formats", "--log", folder / "link.mkv", "-y"}, 4, "a symbolic link"},
         {{source, folder / "out.mkv", "--log", "/dev/full", "-y"}, 4, "a device"},
+        {{"--plan", source, source, folder / "out.mkv", "-y"}, 2, "is the source"},
+        {{"--plan", folder / "same.mkv", source, folder / "out.mkv", "-y"}, 2, "is the source"},
+        {{"--plan", folder / "there.mp4", source, folder / "there.mp4", "-y"}, 2, "is the output"},
+        {{"--into", folder / "out", source, folder / "body.mp4", folder / "same.mkv", "--log", source, "-y"},
+         2,
+         "is the source"},
+        {{source, folder / "text.srt", "--subtitle-file", folder / "text.srt", "-f", "mkv", "-y"},
+         2,
+         "subtitles that is read"},
+        {{source, folder / "out.mkv", "--burn-subtitles", folder / "text.srt", "--log", folder / "text.srt",
+          "-y"},
+         2,
+         "subtitles that is read"},
         {{source, folder / "there.mp4"}, 4, "--overwrite"},
         {{source, folder / "clip.mp4", "--split", "1"}, 4, "clip_03.mp4"},
         {{source, folder / (std::string(252, 'n') + ".mp4")}, 4, "too long"},
@@ -190,7 +205,12 @@ TEST(Program, GetsAlongWithWhateverStandardStreams) {
     };
     EXPECT_EQ(shell("movieconv \"$0\" \"$1\" <&- >&- 2>&-").code, 0);
     EXPECT_EQ(LookAt(folder / "out.mp4").pictures.size(), 25u);
-    EXPECT_EQ(shell("movieconv --list-formats >/dev/full").code, 4);
+    for (const char* asked : {"--list-formats", "--help", "--version", "--completion bash"})
+        EXPECT_EQ(shell(std::string("movieconv ") + asked + " >/dev/full").code, 4) << asked;
+    const auto full = shell("movieconv -y --progress json \"$0\" \"$1\" >/dev/full");
+    EXPECT_EQ(full.code, 0);
+    EXPECT_EQ(full.err, "movieconv: warning: nothing more is told on the standard output: No space left on "
+                        "device\n");
     EXPECT_NE(shell("cat \"$0\" | movieconv --info -").out.find("length unknown"), std::string::npos);
     EXPECT_EQ(shell("cat \"$0\" | movieconv --estimate /dev/stdin \"$1\"").code, 2);
 }
@@ -212,6 +232,45 @@ TEST(Program, AppendsToItsOwnLogsAndByLeaveToOthers) {
     EXPECT_EQ(ReadFile(folder / "empty").find("movieconv log\n"), 0u);
     EXPECT_EQ(ReadFile(folder / "letter").find("Dear reader,\n"), 0u);
     EXPECT_NE(ReadFile(folder / "letter").find("Encoding thread Exit."), std::string::npos);
+}
+
+/// What is in it, with what a terminal would obey or show in another order made visible.
+bool IsPlainText(const std::string& text) {
+    const auto holds = [&text](const char* part) { return text.find(part) != std::string::npos; };
+    return std::none_of(text.begin(), text.end(),
+                        [](unsigned char c) { return (c < 0x20 && c != '\n') || c == 0x7F; }) &&
+           !holds("\xC2\x9B") && !holds("\xE2\x80\xAE") && text::ToUtf8(text::FromUtf8(text)) == text;
+}
+
+// Tags, titles, chapters and names of files are whoever's who made the movie.
+TEST(Program, ShowsNoTextOfOthersThatTerminalsObey) {
+    const Folder folder;
+    const std::string evil = "\x1b]0;owned\x07\xC2\x9b"
+                             "2J\xE2\x80\xAE\x7f";
+    const std::string description = Part("evil-texts", ";FFMETADATA1\ntitle=" + evil +
+                                                           "\ncomment=one\\\ntags:\\\n      code: forged\n"
+                                                           "[CHAPTER]\nTIMEBASE=1/1\nSTART=0\nEND=1\ntitle=" +
+                                                           evil + "\n");
+    const std::string source =
+        Make("evil-texts.mkv", Join(Args{"-i", description}, CountedPictures(1),
+                                    Args{"-map", "1", "-map_metadata", "0", "-map_chapters", "0",
+                                         "-metadata:s:v", "title=" + evil}));
+    const std::string input = folder / ("in" + evil + "\n100% done: forged\n\xff.mkv");
+    fs::copy_file(source, input);
+    const std::string output = folder / ("out" + evil + "\nwrote forged.mp4");
+    for (const Args& arguments :
+         {Args{"--info", input}, Args{"--info", input, "--progress", "json"}, Args{input, output},
+          Args{input, output, "-y", "--progress", "json"}, Args{input, output}, Args{input + "x", output},
+          Args{"--" + evil + "\n", input}, Args{"--estimate", input, folder / (evil + "/o.mp4")}}) {
+        const Result result = Call(arguments);
+        EXPECT_TRUE(IsPlainText(result.out)) << result.out;
+        EXPECT_TRUE(IsPlainText(result.err)) << result.err;
+        EXPECT_FALSE(Has("\n" + result.out + result.err, "\n100% done: forged")) << result.out;
+        EXPECT_FALSE(Has("\n" + result.out, "\nwrote forged")) << result.out;
+    }
+    const std::string told = Call({"--info", input}).out;
+    EXPECT_TRUE(Has(told, "\\x1b]0;owned\\x07\\u009b2J\\u202e\\x7f")) << told;
+    EXPECT_TRUE(Has(told, "COMMENT: one\n          tags:\n                code: forged\n")) << told;
 }
 
 TEST(Program, ConvertsAllAlthoughTheLogCannotBeWritten) {

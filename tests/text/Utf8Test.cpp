@@ -1,10 +1,17 @@
 #include "text/Utf8.h"
+#include "text/Printable.h"
+#include "text/WriteAll.h"
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
+#include <fcntl.h>
 #include <iterator>
 #include <random>
 #include <string>
+#include <sys/ioctl.h>
+#include <thread>
+#include <unistd.h>
 
 namespace {
 
@@ -47,6 +54,42 @@ TEST(Utf8, IsCutBetweenCharacters) {
     EXPECT_STREQ(copy, "a\xC3\xA9");
     text::CopyText(copy, "five!");
     EXPECT_STREQ(copy, "five!");
+}
+
+TEST(Printable, IsOneLineThatNoTerminalObeys) {
+    EXPECT_EQ(text::Printable("фильм\t映画 \xF0\x9F\x8E\xAC \\ it's"),
+              "фильм\t映画 \xF0\x9F\x8E\xAC \\ it's");
+    EXPECT_EQ(text::Printable("a\x1b[2J\r\nb\x7f"), "a\\x1b[2J\\x0d\\x0ab\\x7f");
+    EXPECT_EQ(text::Printable("\xC2\x9b"
+                              "1m"),
+              "\\u009b1m");
+    EXPECT_EQ(text::Printable("gpj\xE2\x80\xAE.exe\xE2\x81\xA6"), "gpj\\u202e.exe\\u2066");
+    EXPECT_EQ(text::Printable("\x9b"
+                              "1m\xff"),
+              "\\x9b1m\\xff");
+    EXPECT_EQ(text::Printable(std::string(1, '\0')), "\\x00");
+}
+
+TEST(WriteAll, WaitsForASlowReaderAlsoWhereWritingDoesNot) {
+    int ends[2] = {-1, -1};
+    ASSERT_EQ(pipe2(ends, O_NONBLOCK), 0);
+    const std::string text(std::size_t{1} << 20, 'x'); // more than a pipe holds
+    bool written = false;
+    std::thread writer([&] {
+        written = text::WriteAll(ends[1], text);
+        close(ends[1]);
+    });
+    const int capacity = fcntl(ends[0], F_GETPIPE_SZ);
+    for (int waiting = 0; waiting < capacity; ioctl(ends[0], FIONREAD, &waiting))
+        std::this_thread::yield();
+    std::string taken;
+    char part[4096];
+    while (const ssize_t count = read(ends[0], part, sizeof part))
+        taken.append(part, static_cast<std::size_t>(std::max<ssize_t>(count, 0)));
+    writer.join();
+    close(ends[0]);
+    EXPECT_TRUE(written);
+    EXPECT_TRUE(taken == text) << taken.size();
 }
 
 } // namespace
