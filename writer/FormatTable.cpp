@@ -11,6 +11,7 @@ extern "C" {
 #include <algorithm>
 #include <cctype>
 #include <cstring>
+#include <limits>
 #include <string_view>
 #include <utility>
 
@@ -334,9 +335,11 @@ AVCodecID PacketForm(const Container& container, AVCodecID codec) {
 }
 
 bool CarriesTag(const Container& container, const std::string& key, const std::string& value) {
-    constexpr size_t kMost = 65535; // where lengths have 16 bits
+    const size_t most = container.tags == kServiceTags       ? 255 // lengths have 8 bits, or 16
+                        : (container.ways & kShortTags) != 0 ? 65535
+                                                             : std::numeric_limits<size_t>::max();
     return (container.carries & kTags) != 0 && (container.tags == nullptr || IsListed(container.tags, key)) &&
-           ((container.ways & kShortTags) == 0 || value.size() <= kMost);
+           value.size() <= most;
 }
 
 bool CarriesTrackTag(const Container& container, const std::string& key, const std::string& value) {

@@ -12,6 +12,7 @@ extern "C" {
 
 #include <algorithm>
 #include <array>
+#include <cerrno>
 #include <cstdlib>
 #include <cstring>
 #include <limits>
@@ -26,6 +27,9 @@ namespace {
 /// no other may be finer.
 constexpr AVRational kCueUnit{1, 192000};
 constexpr AVRational kTick{1, kTicksPerSecond};
+constexpr int64_t kFarthest = 1000 * 3600 * kTicksPerSecond; // of a text's begin, in a movie that is none
+constexpr int64_t kLongest = 3600 * kTicksPerSecond;         // of a packet in MP4, whose lengths have 31 bits
+constexpr int kMostOfText = 65535; // bytes: MP4 has no more, and who reads more takes for ever
 constexpr int64_t kUnknownLength = 5 * kTicksPerSecond; // of a text that does not say how long it is shown
 
 const Carriage kAsUsual{};
@@ -50,14 +54,31 @@ public:
 protected:
     /// `packet` at its time in the file, in 100 ns units.
     void HandOn(AVPacket& packet, int64_t begin, int64_t duration) {
+        if (begin > kFarthest) {
+            Drop("written", AVERROR(ERANGE));
+            return;
+        }
+        const int64_t end = begin + std::min(duration, kFarthest);
         // The multiplexer ends a text only when other streams come in between, which they do not at the
         // close.
-        if (parameters_->codec_id == AV_CODEC_ID_MOV_TEXT && end_ && *end_ < begin)
+        const bool fillsTime = parameters_->codec_id == AV_CODEC_ID_MOV_TEXT;
+        if (fillsTime && end_ && *end_ < begin)
             HandOnEmpty(*end_, begin);
-        end_ = begin + duration;
-        Send(packet, begin, duration);
+        end_ = end;
+        for (; fillsTime && end - begin > kLongest; begin += kLongest) {
+            const av::Packet part(av_packet_clone(&packet));
+            if (!part)
+                throw std::bad_alloc();
+            Send(*part, begin, kLongest);
+        }
+        Send(packet, begin, end - begin);
     }
     void HandOn(AVPacket& packet) { take_(packet); }
+
+    void Drop(const char* what, int error) {
+        ++*track_.lostCues;
+        WriteLog(kLogWarning, "A subtitle could not be %s: %s.", what, av::ErrorText(error).c_str());
+    }
 
     const Track& track_;
     const AVRational unit_;
@@ -66,10 +87,12 @@ protected:
 private:
     void HandOnEmpty(int64_t begin, int64_t end) {
         constexpr int kNoLetters = 2; // the length of a text
-        const av::Packet packet = av::NewPacket();
-        av::CheckMemory(av_new_packet(packet.get(), kNoLetters));
-        std::fill_n(packet->data, kNoLetters, uint8_t{0});
-        Send(*packet, begin, end - begin);
+        for (; begin < end; begin += kLongest) {
+            const av::Packet packet = av::NewPacket();
+            av::CheckMemory(av_new_packet(packet.get(), kNoLetters));
+            std::fill_n(packet->data, kNoLetters, uint8_t{0});
+            Send(*packet, begin, std::min(end - begin, kLongest));
+        }
     }
 
     void Send(AVPacket& packet, int64_t begin, int64_t duration) {
@@ -242,6 +265,10 @@ private:
             throw std::bad_alloc();
         packet->pts = packet->dts = 0;
         packet->duration = 1;
+        if (packet->size > kMostOfText) {
+            Drop("read", AVERROR(EMSGSIZE));
+            return {};
+        }
         AVSubtitle decoded{};
         int got = 0;
         const int result = avcodec_decode_subtitle2(decoder_.get(), &decoded, &got, packet.get());
@@ -292,11 +319,6 @@ private:
         for (int i = 0; i < kFieldsBefore && at != std::string::npos; ++i)
             at = event.find(',', at == 0 && i == 0 ? 0 : at + 1);
         return at == std::string::npos ? std::string() : event.substr(at + 1);
-    }
-
-    void Drop(const char* what, int error) {
-        ++*track_.lostCues;
-        WriteLog(kLogWarning, "A subtitle could not be %s: %s.", what, av::ErrorText(error).c_str());
     }
 
     static constexpr size_t kLeastRoom = 65536;

@@ -226,6 +226,30 @@ TEST(Tracks, TextsComeFromFilesInAnyCharacterSet) {
               2);
 }
 
+// MP4 has 31 bits for the length of a text, and of the pause before it.
+TEST(Tracks, TextsMayBeFarApartAndLongButNotWithoutEnd) {
+    const Folder folder;
+    WriteFile(folder / "far.srt", "1\n00:00:00,500 --> 00:00:01,000\nA\n\n"
+                                  "2\n04:00:00,000 --> 08:00:00,000\nB\n\n"
+                                  "3\n08:00:01,000 --> 08:00:02,000\n" +
+                                      std::string(1 << 20, 'C') +
+                                      "\n\n"
+                                      "4\n900000:00:00,000 --> 900000:00:01,000\nD\n");
+    for (const char* name : {"out.mp4", "out.webm"}) {
+        const Result made = Call({TwoSounds(), folder / name, "--subtitle-file", folder / "far.srt"});
+        ASSERT_EQ(made.code, 0) << made.err;
+        EXPECT_TRUE(Has(made.err, "2 of their texts could not be converted")) << made.err;
+        const std::string texts = TextsOf(folder / name);
+        EXPECT_TRUE(Has(texts, " 04:00:00,00") && Has(texts, "--> 08:00:00,00")) << texts;
+        EXPECT_FALSE(Has(texts, "C") || Has(texts, "D")) << texts.size();
+    }
+    const std::string title(256, 't'); // one more than broadcasts have
+    const Result made =
+        Call({TwoSounds(), folder / "out.ts", "--length", "1", "--metadata", "title=" + title});
+    EXPECT_EQ(made.code, 0) << made.err;
+    EXPECT_TRUE(Has(made.err, "cannot hold title")) << made.err;
+}
+
 TEST(Tracks, TextsAboutTheMovieAreReplacedOrLeftOut) {
     const Folder folder;
     ASSERT_EQ(Call({TwoSounds(), folder / "a.mkv", "--length", "0.5", "--metadata", "title=Old", "--metadata",
