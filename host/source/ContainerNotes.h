@@ -21,14 +21,18 @@ struct ContainerNotes {
         std::string name;
         std::string description;
     };
+    struct Titles {
+        std::string first;
+        std::string last; ///< Which is the one that FFmpeg takes.
+    };
     std::vector<Stream> streams; ///< For each stream of FFmpeg's.
 
     // Of Matroska:
-    std::string title;         ///< Where a tag of that name hides it.
-    std::vector<Tag> repeated; ///< Texts that are there several times: all of them, ";" in between.
-    std::vector<File> files;   ///< Attached ones that are described.
-    int chapters = 0;          ///< All there are, of every edition and within each other.
-    int furtherTitles = 0;     ///< Chapters that have more titles than one, in several languages.
+    std::string title;          ///< Where a tag of that name hides it.
+    std::vector<Tag> repeated;  ///< Texts that are there several times: all of them, ";" in between.
+    std::vector<File> files;    ///< Attached ones that are described.
+    int chapters = 0;           ///< All there are, of every edition and within each other.
+    std::vector<Titles> titles; ///< Of each chapter that has several, in several languages.
 };
 
 ContainerNotes ReadContainerNotes(const InputFile& file, const AVFormatContext& context);

@@ -7,7 +7,6 @@
 #include <array>
 #include <cstdint>
 #include <map>
-#include <set>
 #include <utility>
 
 namespace movieconv {
@@ -115,16 +114,21 @@ private:
             return;
         ForEach(whole, kChapter, [&](const Part& chapter) {
             ++notes_.chapters;
-            notes_.furtherTitles += depth == 0 && HasSeveralTitles(chapter) ? 1 : 0;
+            if (depth == 0)
+                ReadTitles(chapter);
             ReadChapters(chapter, depth + 1);
         });
     }
 
-    bool HasSeveralTitles(const Part& chapter) {
-        std::set<std::string> titles;
-        ForEach(chapter, kChapterDisplay,
-                [&](const Part& display) { titles.insert(Text(display, kChapterTitle, kLongestName)); });
-        return titles.size() > 1;
+    void ReadTitles(const Part& chapter) {
+        std::vector<std::string> titles;
+        ForEach(chapter, kChapterDisplay, [&](const Part& display) {
+            std::string title = Text(display, kChapterTitle, kLongestName);
+            if (!title.empty() && std::find(titles.begin(), titles.end(), title) == titles.end())
+                titles.push_back(std::move(title));
+        });
+        if (titles.size() > 1)
+            notes_.titles.push_back({titles.front(), titles.back()});
     }
 
     /// Of the texts about the movie, those that come again under a key that FFmpeg has for one of them.

@@ -35,6 +35,20 @@ void ReplaceTag(std::vector<Tag>& tags, const std::string& key, const std::strin
         known->value = ToUtf8(text, "");
 }
 
+/// Of a chapter's titles the first one is what people gave it first.
+void PreferFirstTitles(const std::vector<ContainerNotes::Titles>& titles, std::vector<Chapter>& chapters) {
+    auto next = chapters.begin();
+    for (const ContainerNotes::Titles& each : titles) {
+        const auto found = std::find_if(next, chapters.end(), [&](const Chapter& chapter) {
+            return chapter.title == ToUtf8(each.last, "");
+        });
+        if (found != chapters.end()) {
+            found->title = ToUtf8(each.first, "");
+            next = found + 1;
+        }
+    }
+}
+
 /// Gives attached files what is said of them, each to the first one of its name that has nothing yet.
 void DescribeFiles(const std::vector<ContainerNotes::File>& files, std::vector<StreamInfo>& streams) {
     for (const ContainerNotes::File& file : files) {
@@ -64,7 +78,8 @@ void TakeNotes(const ContainerNotes& notes, SourceInfo& info) {
         ReplaceTag(info.tags, tag.key, tag.value);
     ReplaceTag(info.tags, "title", notes.title);
     DescribeFiles(notes.files, info.streams);
-    info.furtherTitles = notes.furtherTitles;
+    PreferFirstTitles(notes.titles, info.chapters);
+    info.furtherTitles = static_cast<int>(notes.titles.size());
     info.unreadChapters = std::max(notes.chapters - static_cast<int>(info.chapters.size()), 0);
 }
 
