@@ -46,8 +46,9 @@ public:
     }
 
     /// A text for `read`, which returns false where it is not `notation`: so the message calls that.
-    void Read(const std::string& names, const std::string& type, std::function<bool(const std::string&)> read,
-              const std::string& notation, const std::string& help) {
+    void Read(const std::string& names, const std::string& type,
+              const std::function<bool(const std::string&)>& read, const std::string& notation,
+              const std::string& help) {
         Taken<std::string>(
             names, type, [=](const std::string& text) { Require(read(text), names, text, notation); }, help);
     }
@@ -100,8 +101,9 @@ public:
     }
 
     /// An option that may be repeated: a text for `read`, as above, each time.
-    void Each(const std::string& names, const std::string& type, std::function<bool(const std::string&)> read,
-              const std::string& notation, const std::string& help) {
+    void Each(const std::string& names, const std::string& type,
+              const std::function<bool(const std::string&)>& read, const std::string& notation,
+              const std::string& help) {
         const auto take = [=](const std::vector<std::string>& texts) {
             for (const std::string& text : texts)
                 Require(read(text), names, text, notation);
