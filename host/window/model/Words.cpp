@@ -57,7 +57,8 @@ QString ClockText(double seconds) {
 
 QString ExactClockText(double seconds) {
     const int64_t milliseconds = std::llround(std::max(0.0, seconds) * 1000);
-    const QString clock = ClockText(static_cast<double>(milliseconds / 1000));
+    const int64_t whole = milliseconds / 1000;
+    QString clock = ClockText(static_cast<double>(whole));
     if (milliseconds % 1000 == 0)
         return clock;
     QString rest = QStringLiteral("%1").arg(milliseconds % 1000, 3, 10, QLatin1Char('0'));

@@ -62,7 +62,7 @@ QString Word(const QString& word) {
 /// "a", "a and b", "a, b and c".
 QString List(const QString& list) {
     QStringList items = list.split(QLatin1String(" and "));
-    const QString last = Word(items.takeLast());
+    QString last = Word(items.takeLast());
     if (items.isEmpty())
         return last;
     items = items.join(QLatin1String(" and ")).split(QLatin1String(", "));
