@@ -1,4 +1,4 @@
-# Writes an entry of ctest for each suite of a test program, whose tests follow each other in one process:
+# Writes an entry of ctest for each suite of a test program, whose tests follow each other in one process, and names those:
 # -D PROGRAM=COMMAND -D LEFT_OUT=PATTERN -D FILE=FILE
 cmake_minimum_required(VERSION 3.25)
 list(REMOVE_ITEM PROGRAM "")
@@ -11,11 +11,13 @@ execute_process(COMMAND ${PROGRAM} --gtest_list_tests --gtest_filter=*${left_out
 string(REPLACE ";" "," listed "${listed}")
 string(REPLACE "\n" ";" listed "${listed}")
 set(suite "")
+set(names "")
 foreach(line IN LISTS listed)
   if(line MATCHES "^([A-Za-z0-9_/]+)\\.( |$)")
     set(suite ${CMAKE_MATCH_1})
     list(APPEND suites ${suite})
-  elseif(suite AND line MATCHES "^  ")
+  elseif(suite AND line MATCHES "^  ([A-Za-z0-9_/]+)")
+    string(APPEND names "# ${suite}.${CMAKE_MATCH_1}\n")
     math(EXPR tests_${suite} "${tests_${suite}} + 1")
   endif()
 endforeach()
@@ -30,4 +32,4 @@ foreach(suite IN LISTS suites)
   string(APPEND entries "add_test([==[${suite}]==] [==[${command}]==] [==[--gtest_filter=${suite}.*${left_out}]==])\n"
     "set_tests_properties([==[${suite}]==] PROPERTIES TIMEOUT 1200 COST ${tests_${suite}})\n")
 endforeach()
-file(WRITE ${FILE} "${entries}")
+file(WRITE ${FILE} "${names}${entries}")

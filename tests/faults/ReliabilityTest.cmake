@@ -1,5 +1,10 @@
 # Every test that docs/reliability.md names as a proof, in the last column of its tables, exists.
 execute_process(COMMAND ${CTEST} --test-dir ${BUILD} -N OUTPUT_VARIABLE tests COMMAND_ERROR_IS_FATAL ANY)
+file(GLOB_RECURSE suites ${BUILD}/tests/*-suites.cmake)
+foreach(suite IN LISTS suites)
+  file(READ ${suite} names)
+  string(APPEND tests "${names}")
+endforeach()
 file(STRINGS ${ROOT}/docs/reliability.md rows REGEX "^\\|.*`")
 set(named 0)
 foreach(row IN LISTS rows)
