@@ -2,6 +2,7 @@
 
 #include "host/convert/Formats.h"
 #include "host/presets/Notation.h"
+#include "host/source/SubtitleFile.h"
 
 #include <algorithm>
 #include <cctype>
@@ -67,7 +68,8 @@ bool ReadMetadata(const std::string& text, Request& request) {
     const std::size_t equals = text.find('=');
     if (equals == std::string::npos || equals == 0)
         return false;
-    request.metadata.push_back({text.substr(0, equals), text.substr(equals + 1)});
+    // From a terminal of another character set; containers hold UTF-8 only.
+    request.metadata.push_back({ToUtf8(text.substr(0, equals), ""), ToUtf8(text.substr(equals + 1), "")});
     return true;
 }
 

@@ -264,6 +264,8 @@ TEST(Tracks, TextsAboutTheMovieAreReplacedOrLeftOut) {
     EXPECT_EQ(tags({"--metadata", "Artist=", "--metadata", "title=New=Newer"}),
               "format|tag:title=New=Newer\n");
     EXPECT_EQ(tags({"--no-metadata", "--metadata", "title=New"}), "format|tag:title=New\n");
+    EXPECT_EQ(tags({"--no-metadata", "--metadata", "title=Gr\xFC\xDF"}),
+              "format|tag:title=Gr\xC3\xBC\xC3\x9F\n");
     EXPECT_EQ(Call({TwoSounds(), folder / "c.mkv", "--metadata", "title"}).code, 2);
 }
 
