@@ -91,7 +91,7 @@ struct WindowBench : testing::Test {
         return nullptr;
     }
     void Act(const char* name) {
-        QAction* action = The<QAction>(name);
+        auto* action = The<QAction>(name);
         EXPECT_TRUE(action->isEnabled()) << name;
         action->trigger();
     }
@@ -110,10 +110,9 @@ struct WindowBench : testing::Test {
         return Await([&] { return runner.scripts.size() == count; });
     }
     bool Tells(const QString& words) {
-        for (const QLabel* label : The<movieconv::window::NoticeBar>()->findChildren<QLabel*>())
-            if (label->text().contains(words))
-                return true;
-        return false;
+        const auto labels = The<movieconv::window::NoticeBar>()->findChildren<QLabel*>();
+        return std::any_of(labels.begin(), labels.end(),
+                           [&](const QLabel* label) { return label->text().contains(words); });
     }
     template <class Page>
     bool Shows() {
