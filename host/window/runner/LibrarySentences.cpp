@@ -57,6 +57,7 @@ constexpr const char* kSentences[] = {
 
     // What is wrong with the place of an output.
     QT_TRANSLATE_NOOP("Library", "“%1” is the source itself; give the output another name"),
+    QT_TRANSLATE_NOOP("Library", "“%1” is a file of subtitles that is read; give the output another name"),
     QT_TRANSLATE_NOOP("Library", "“%1” is a folder; name a file in it"),
     QT_TRANSLATE_NOOP("Library", "“%1” is not a file but a device or a pipe; name a file"),
     QT_TRANSLATE_NOOP("Library", "“%1” is a link to a missing file; name that file, or remove the link"),
@@ -180,6 +181,7 @@ constexpr const char* kSentences[] = {
     QT_TRANSLATE_NOOP("Library", "%1: this is no JSON: %2"),
     QT_TRANSLATE_NOOP("Library", "%1:1: a preset is a JSON object, in braces"),
 
+    QT_TRANSLATE_NOOP("Library", "%1: this is nested too deep for a preset"),
     QT_TRANSLATE_NOOP("Library", "cannot read the preset “%1”: %2"),
     QT_TRANSLATE_NOOP("Library", "“%1” is too large for a preset"),
     QT_TRANSLATE_NOOP("Library", "a preset has a name"),

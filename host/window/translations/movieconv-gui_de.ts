@@ -1053,6 +1053,14 @@
         <source>%1: there is no “%2” in presets; it has no effect</source>
         <translation>%1: „%2“ gibt es in Vorlagen nicht; es bewirkt nichts</translation>
     </message>
+    <message>
+        <source>“%1” is a file of subtitles that is read; give the output another name</source>
+        <translation>„%1“ ist eine Untertiteldatei, die gelesen wird; die neue Datei braucht einen anderen Namen</translation>
+    </message>
+    <message>
+        <source>%1: this is nested too deep for a preset</source>
+        <translation>%1: das ist für eine Vorlage zu tief verschachtelt</translation>
+    </message>
 </context>
 <context>
     <name>LogShare</name>
