@@ -29,6 +29,25 @@
 namespace movieconv {
 namespace {
 
+constexpr char kNoMemory[] = "movieconv: error: there is not enough memory\n";
+
+/// A lack of memory also comes where no exception may pass, since destructors of libraries allocate. What is
+/// being written stays as after a kill.
+void TellLackOfMemoryWhereNothingMayThrow() {
+    static const std::terminate_handler usual = std::get_terminate();
+    std::set_terminate([] {
+        try {
+            if (std::current_exception())
+                throw;
+        } catch (const std::bad_alloc&) {
+            if (write(STDERR_FILENO, kNoMemory, sizeof kNoMemory - 1) >= 0)
+                _exit(static_cast<int>(ExitCode::kInternal));
+        } catch (...) { // as usual
+        }
+        usual();
+    });
+}
+
 void LimitHeap() {
     mallopt(M_ARENA_MAX, 1); // heaps of their own for the dozen threads cost 20 MB and save no time
 }
@@ -169,7 +188,7 @@ void Tell(const Failure& failure) {
     try {
         std::fprintf(stderr, "movieconv: error: %s\n", text::Printable(Explain(failure)).c_str());
     } catch (const std::bad_alloc&) {
-        std::fprintf(stderr, "movieconv: error: there is not enough memory\n");
+        std::fputs(kNoMemory, stderr);
     }
 }
 
@@ -177,6 +196,7 @@ void Tell(const Failure& failure) {
 } // namespace movieconv
 
 int main(int argc, char** argv) {
+    movieconv::TellLackOfMemoryWhereNothingMayThrow();
     movieconv::LimitHeap();
     movieconv::SilenceEncoders();
     movieconv::OpenStandardDescriptors();
@@ -186,7 +206,7 @@ int main(int argc, char** argv) {
         movieconv::Tell(failure);
         return static_cast<int>(movieconv::CodeOf(failure.Kind()));
     } catch (const std::bad_alloc&) {
-        std::fputs("movieconv: error: there is not enough memory\n", stderr);
+        std::fputs(movieconv::kNoMemory, stderr);
         return static_cast<int>(movieconv::ExitCode::kInternal);
     } catch (const std::exception& error) {
         std::fprintf(stderr, "movieconv: internal error: %s\n", error.what());
