@@ -6,7 +6,7 @@ namespace writer {
 namespace {
 
 constexpr int64_t kEmptySize = 2;
-constexpr int64_t kLongest = INT32_MAX / 2; // a sample; multiplexers take no longer ones
+constexpr int64_t kLongestSample = INT32_MAX / 2; // multiplexers take no longer ones
 
 bool IsEmpty(const PlacedPacket& sample) {
     return sample.size <= kEmptySize;
@@ -19,7 +19,7 @@ bool IsEarlier(const PlacedPacket& one, const PlacedPacket& other) {
 void AddPieces(PlacedPacket sample, int64_t end, std::vector<PlacedPacket>& row) {
     while (sample.dts < end) {
         sample.pts = sample.dts;
-        sample.duration = std::min(end - sample.dts, kLongest);
+        sample.duration = std::min(end - sample.dts, kLongestSample);
         row.push_back(sample);
         sample.dts += sample.duration;
     }

@@ -37,8 +37,8 @@ void TellLackOfMemoryWhereNothingMayThrow() {
     static const std::terminate_handler usual = std::get_terminate();
     std::set_terminate([] {
         try {
-            if (std::current_exception())
-                throw;
+            if (const std::exception_ptr error = std::current_exception())
+                std::rethrow_exception(error);
         } catch (const std::bad_alloc&) {
             if (write(STDERR_FILENO, kNoMemory, sizeof kNoMemory - 1) >= 0)
                 _exit(static_cast<int>(ExitCode::kInternal));
