@@ -74,8 +74,10 @@ void ReadFile(CueList& list, const Source& source, const BurnWish& wish) {
             const auto ticks = [&](int64_t stamp) {
                 return av_rescale_q(stamp, stream.time_base, {1, kTicksPerSecond});
             };
-            if (packet->pts != AV_NOPTS_VALUE)
-                Add(list, std::move(packet), ticks(packet->pts), ticks(packet->duration));
+            const int64_t begin = packet->pts;
+            const int64_t duration = packet->duration;
+            if (begin != AV_NOPTS_VALUE)
+                Add(list, std::move(packet), ticks(begin), ticks(duration));
         }
     } catch (const TrackError&) {
         throw;
