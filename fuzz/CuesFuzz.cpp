@@ -85,8 +85,8 @@ void FuzzRow(FuzzedDataProvider& input) {
         position = end;
     });
     for (int count = input.ConsumeIntegralInRange(0, 40); count > 0; --count) {
-        const int64_t begin = WildInteger<int64_t>(input, input.ConsumeIntegralInRange<int64_t>(-100, 1000));
-        const int64_t end = WildInteger<int64_t>(input, input.ConsumeIntegralInRange<int64_t>(-100, 1000));
+        const auto begin = WildInteger<int64_t>(input, input.ConsumeIntegralInRange<int64_t>(-100, 1000));
+        const auto end = WildInteger<int64_t>(input, input.ConsumeIntegralInRange<int64_t>(-100, 1000));
         if (input.ConsumeIntegralInRange(0, 7) == 0)
             row.Reach(begin);
         else

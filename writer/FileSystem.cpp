@@ -173,7 +173,8 @@ std::unique_ptr<ByteFile> CreateBeside(FileSystem& files, const std::string& tar
     const size_t longest = told > 0 ? std::min<size_t>(static_cast<size_t>(told), NAME_MAX) : NAME_MAX;
     for (int number = 1; number <= text::kMostPartials; ++number) {
         const std::string tail = text::PartialSuffix(number);
-        path = folder + std::string(text::CutTo(longest - tail.size(), name)) + tail;
+        path = folder;
+        path.append(text::CutTo(longest - tail.size(), name)).append(tail);
         std::unique_ptr<ByteFile> file = files.Create(path, target, error);
         if (file || error != EEXIST)
             return file;

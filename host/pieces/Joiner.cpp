@@ -75,6 +75,8 @@ Verdict JoinPieces(const Plan& plan, const std::string& planPath, bool replace, 
         movie.Sound() != nullptr ? movie.Sound()->GetAudioInfo()->format : AudioFormat{};
     std::vector<std::string> paths;
     std::vector<const char*> names;
+    paths.reserve(static_cast<std::size_t>(plan.Pieces()));
+    names.reserve(paths.capacity());
     for (int number = 0; number < plan.Pieces(); ++number)
         paths.push_back(PiecePath(planPath, number));
     for (const std::string& path : paths)

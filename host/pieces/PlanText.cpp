@@ -89,7 +89,7 @@ int64_t Natural(const Json& json, const char* name) {
 
 /// A path that names one place, without going back on its way.
 std::string Path(const Json& json) {
-    const auto text = json.get<std::string>();
+    auto text = json.get<std::string>();
     const std::filesystem::path path(text);
     if (!path.is_absolute() || path.lexically_normal() != path || text.find('\0') != std::string::npos)
         RefusePlan(fmt::format("\"{}\" is not an absolute path without detours", text));

@@ -153,6 +153,7 @@ std::vector<std::optional<int64_t>> TicksBefore(const EncodeParam& param, Movie&
     if (MWPlanTicks(&param, &format, times.data(), static_cast<int64_t>(times.size()), ticks.data()) == 0)
         throw Failure(Category::kInternal, "the pictures cannot be placed in the output");
     std::vector<std::optional<int64_t>> before;
+    before.reserve(ticks.size());
     for (const int64_t tick : ticks)
         before.push_back(tick == kWriterNoTick ? std::nullopt : std::optional(tick));
     return before;

@@ -80,9 +80,7 @@ void FromJson(const Json& json, Value& value) {
         value.bottom = json.at(1).get<int>();
         value.left = json.at(2).get<int>();
         value.right = json.at(3).get<int>();
-    } else if constexpr (std::is_same_v<Value, Tag>) {
-        value = {json.at(0).get<std::string>(), json.at(1).get<std::string>()};
-    } else if constexpr (std::is_same_v<Value, SubtitleFileWish>) {
+    } else if constexpr (std::is_same_v<Value, Tag> || std::is_same_v<Value, SubtitleFileWish>) {
         value = {json.at(0).get<std::string>(), json.at(1).get<std::string>()};
     } else if constexpr (std::is_same_v<Value, bool>) {
         value = json.get<bool>();
@@ -286,7 +284,7 @@ std::string DifferenceIn(const Json& before, const Json& now, const std::vector<
 Request SettingsFromJson(const Json& json) {
     Request request;
     Json asked = json;
-    const Json preferences = json.at("preferences");
+    const Json& preferences = json.at("preferences");
     asked.erase("preferences");
     Reader reader(asked);
     Asked(reader, request);

@@ -59,9 +59,10 @@ void WriteWhole(const std::string& path, std::string_view text) {
                          fsync(file.Number()) == 0 && file.Close() && RenameLastingly(making, path);
     if (written)
         return;
-    const Failure failure = CannotWrite(path);
+    const int error = errno;
     unlink(making.c_str());
-    throw failure;
+    errno = error;
+    throw CannotWrite(path);
 }
 
 void AppendWhole(const std::string& path, std::string_view text) {

@@ -133,7 +133,7 @@ private:
         };
         if (IsLadder(value)) {
             for (const auto& [bound, figure] : value.items())
-                take(*ParseBound(bound), figure, pointer + "/" + bound);
+                take(*ParseBound(bound), figure, fmt::format("{}/{}", pointer, bound));
         } else {
             take(0, value, pointer);
         }
@@ -144,7 +144,7 @@ private:
         if (!object.is_object())
             Refuse(pointer, "an object, in braces");
         for (const auto& [key, value] : object.items()) {
-            const std::string at = pointer + "/" + key;
+            const std::string at = fmt::format("{}/{}", pointer, key);
             const auto found = known.find(key);
             if (found == known.end())
                 complaints_.push_back(fmt::format("{}: there is no \"{}\" in presets; it has no effect",
@@ -180,7 +180,7 @@ private:
             const std::optional<uint32_t> codec = ParseCode(name);
             if (!codec)
                 Refuse(pointer, kWanted);
-            preferences_.quality[*codec] = steps(figures, pointer + "/" + name);
+            preferences_.quality[*codec] = steps(figures, fmt::format("{}/{}", pointer, name));
         }
     }
 

@@ -5,6 +5,7 @@
 #include "host/source/SourceError.h"
 
 #include <algorithm>
+#include <array>
 #include <cmath>
 #include <cstdlib>
 #include <cstring>
@@ -91,10 +92,9 @@ std::string OneLine(std::string text) {
 }
 
 bool Moves(const std::string& line) {
-    for (const char* mark : {"\\t(", "\\move", "\\fad", "\\k", "\\K", "Banner;", "Scroll "})
-        if (line.find(mark) != std::string::npos)
-            return true;
-    return false;
+    constexpr std::array kMarks{"\\t(", "\\move", "\\fad", "\\k", "\\K", "Banner;", "Scroll "};
+    return std::any_of(kMarks.begin(), kMarks.end(),
+                       [&line](const char* mark) { return line.find(mark) != std::string::npos; });
 }
 
 /// The events of a list as one script has them, in the order of their begins.

@@ -121,7 +121,7 @@ void Session::Showed(const std::shared_ptr<const ShownPicture>& news) {
 
 void Session::Ended(const Verdict& news) {
     if (!started_ && news.failure)
-        throw *news.failure;
+        throw Failure(*news.failure);
     if (preview_) {
         if (const std::string failure = preview_->Finish(); !failure.empty())
             reporter_->Warn(failure);

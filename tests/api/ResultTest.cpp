@@ -30,7 +30,7 @@ void PrintTo(const Case& test, std::ostream* out) {
     *out << test.name;
 }
 
-std::function<void(TableSource&)> PictureFive(std::function<int(VideoImage&)> change) {
+std::function<void(TableSource&)> PictureFive(const std::function<int(VideoImage&)>& change) {
     return [change](TableSource& source) {
         source.onPicture = [change](int number, VideoImage& image) {
             return number == 5 ? change(image) : 1;

@@ -4,6 +4,7 @@
 
 #include "api/MovieConv.h"
 
+#include <cmath>
 #include <cstring>
 #include <functional>
 #include <vector>
@@ -33,7 +34,7 @@ struct TableSource {
                 },
                 [](void* user, double seconds) {
                     ++Self(user).seeks;
-                    Self(user).picture = static_cast<int>(seconds * 10.0 + 0.5);
+                    Self(user).picture = static_cast<int>(std::lround(seconds * 10.0));
                     return 1;
                 },
                 [](void* user, VideoImage* image) {
@@ -55,7 +56,7 @@ struct TableSource {
                 },
                 [](void* user, double seconds) {
                     ++Self(user).seeks;
-                    Self(user).block = static_cast<int>(seconds * 20.0 + 0.5);
+                    Self(user).block = static_cast<int>(std::lround(seconds * 20.0));
                     return 1;
                 },
                 [](void* user, AudioFrame* frame) {

@@ -62,7 +62,7 @@ Args Late(Dice& dice) {
 
 /// With gaps and uneven steps, reordered in every way, that may begin late.
 void AddPictures(Recipe& recipe, Dice& dice, double seconds, std::string& ending) {
-    const std::string rate = dice.OneOf<std::string>({"24", "25", "30000/1001", "50", "12"});
+    const auto rate = dice.OneOf<std::string>({"24", "25", "30000/1001", "50", "12"});
     Args input = Late(dice);
     Add(input, {"-f", "lavfi", "-i", fmt::format("testsrc=s=96x64:r={}:d={}", rate, seconds)});
     recipe.Take(input, "v");
@@ -141,14 +141,14 @@ void AddTexts(Recipe& recipe, Dice& dice, const Folder& folder, double seconds, 
 
 std::string MakeSource(Dice& dice, const Folder& folder) {
     const double seconds = 0.5 + dice.Up(30) / 10.0;
-    std::string ending = dice.OneOf<std::string>({"mkv", "mp4", "mov", "ts"});
+    auto ending = dice.OneOf<std::string>({"mkv", "mp4", "mov", "ts"});
     Recipe recipe;
     AddPictures(recipe, dice, seconds, ending);
     AddSound(recipe, dice, seconds, ending);
     AddTexts(recipe, dice, folder, seconds, ending);
     if (dice.Once(5))
         Add(recipe.ways, {"-output_ts_offset", std::to_string(dice.Up(20))});
-    const std::string path = folder / ("source." + ending);
+    std::string path = folder / ("source." + ending);
     Args args{"ffmpeg", "-v", "error", "-nostdin", "-y"};
     for (const Args& part : {recipe.inputs, recipe.taken, recipe.ways, Args{path}})
         Add(args, part);

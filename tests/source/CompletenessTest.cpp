@@ -44,7 +44,7 @@ TEST(Completeness, ComparesWhatWasReadWithWhatWasAnnounced) {
     }
 }
 
-std::optional<Shortfall> MissingIn(const std::string& path, SourceChoice choice = {}) {
+std::optional<Shortfall> MissingIn(const std::string& path, const SourceChoice& choice = {}) {
     Movie movie(path, choice);
     inspect::TakeAll(movie);
     return movie.Missing();

@@ -42,7 +42,7 @@ Box BrightPart(const unsigned char* picture, int width, int height) {
 /// Of every picture of a movie of that size.
 std::vector<Box> BoxesOf(const std::string& path, int width, int height) {
     const std::string rows = FfmpegReads(path, Words("-map 0:v:0 -f rawvideo -pix_fmt gray"));
-    const auto size = static_cast<size_t>(width * height);
+    const auto size = static_cast<size_t>(width) * static_cast<size_t>(height);
     EXPECT_EQ(rows.size() % size, 0);
     std::vector<Box> boxes;
     for (size_t at = 0; at + size <= rows.size(); at += size)
@@ -137,7 +137,7 @@ TEST(Burn, TakesFilesAndTheFontsOfTheSource) {
     std::string font = ReadFile("/usr/share/fonts/truetype/dejavu/DejaVuSansMono.ttf");
     if (font.empty())
         GTEST_SKIP() << "without the typeface";
-    for (std::string name : {std::string("DejaVu Sans Mono"), std::string("DejaVuSansMono")}) {
+    for (const std::string& name : {std::string("DejaVu Sans Mono"), std::string("DejaVuSansMono")}) {
         std::string wide;
         for (const char letter : name)
             wide += std::string(1, '\0') + letter;

@@ -26,7 +26,7 @@ std::string MakeWhole(const Folder& folder) {
                                     "[CHAPTER]\nTIMEBASE=1/1000\nSTART=0\nEND=1000\ntitle=First\n"
                                     "[CHAPTER]\nTIMEBASE=1/1000\nSTART=1000\nEND=2000\ntitle=Second\n");
     Ffmpeg(Join(CountedPictures(2), Args{"-frames:v", "1", folder / "cover.png"}));
-    const std::string path = folder / "whole.mkv";
+    std::string path = folder / "whole.mkv";
     Ffmpeg(Join(CountedPictures(2), Beeps(2), Args{"-i", folder / "words.srt", "-i", folder / "notes.txt"},
                 Words("-map 0 -map 1 -map 2 -map_metadata 3 -c:s srt -metadata:s language=ger"),
                 Args{"-attach", folder / "cover.png", "-attach", folder / "font.ttf"},

@@ -87,7 +87,7 @@ Args ForEach(const std::string& option, const std::string& kind, const std::stri
     Args options;
     for (size_t i = 0; i < values.size(); ++i)
         if (!values[i].empty()) {
-            options.push_back(option + ":" + kind + std::to_string(i));
+            options.push_back(std::string(option).append(":").append(kind).append(std::to_string(i)));
             options.push_back(before + values[i]);
         }
     return options;

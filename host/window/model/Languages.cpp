@@ -86,6 +86,7 @@ QString LanguageName(const QString& code) {
 
 std::vector<NamedLanguage> OfferedLanguages() {
     std::vector<NamedLanguage> all;
+    all.reserve(std::size(kLanguages));
     for (const Language& language : kLanguages)
         all.push_back(
             {QLatin1String(language.code), QCoreApplication::translate("Languages", language.name)});
@@ -102,7 +103,7 @@ QString LanguageInName(const std::string& path) {
     parts = parts.mid(1, parts.size() - 2); // between the name and the extension
     std::reverse(parts.begin(), parts.end());
     for (const QString& part : parts) {
-        const QString code = part.size() == 2 || part.size() == 3 ? ShortCode(part) : QString();
+        QString code = part.size() == 2 || part.size() == 3 ? ShortCode(part) : QString();
         if (!NameInTable(code).isEmpty())
             return code;
     }

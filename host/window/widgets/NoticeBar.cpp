@@ -52,7 +52,7 @@ void NoticeBar::Show(const QString& key, const QString& sentence, const std::vec
     for (const auto& [words, deed] : choices) {
         auto* button = new QPushButton(words);
         button->setAccessibleDescription(sentence);
-        connect(button, &QPushButton::clicked, this, [this, key, deed] {
+        connect(button, &QPushButton::clicked, this, [this, key, deed = deed] {
             const auto chosen = deed; // goes with the notice
             Dismiss(key);
             chosen();
