@@ -156,7 +156,7 @@ constexpr std::array kContainers{
     Container{FourCC("FLV "), "Flash Video", "flv", "flv", kStreamed, nullptr,
               kTags, kAnyTags, kNoFlags, nullptr, "aac,mp3", kShortTags, {kH264, kFlv1}, {kAac, kMp3}},
     Container{FourCC("TS  "), "MPEG transport stream", "ts,m2ts,mts", "mpegts", kStreamed, nullptr,
-              kTags | kTracks | kLanguages, kServiceTags, kSenses, "dvb_subtitle", kTsSound, 0,
+              kTags | kTracks | kLanguages, kServiceTags, kSenses, "dvb_subtitle", kTsSound, kTinyTags,
               {kH264, kHevc, kXvid, kMpeg2}, {kAac, kMp3, kAc3, kOpus, kMp2}},
     Container{FourCC("MPG "), "MPEG program stream", "mpg,mpeg,vob", "vob", kStreamed, nullptr,
               0, kNoTags, kNoFlags, nullptr, "mp2,mp3,ac3,dts", 0, {kMpeg2}, {kMp2, kAc3}},
@@ -335,7 +335,7 @@ AVCodecID PacketForm(const Container& container, AVCodecID codec) {
 }
 
 bool CarriesTag(const Container& container, const std::string& key, const std::string& value) {
-    const size_t most = container.tags == kServiceTags       ? 255 // lengths have 8 bits, or 16
+    const size_t most = (container.ways & kTinyTags) != 0    ? 255
                         : (container.ways & kShortTags) != 0 ? 65535
                                                              : std::numeric_limits<size_t>::max();
     return (container.carries & kTags) != 0 && (container.tags == nullptr || IsListed(container.tags, key)) &&

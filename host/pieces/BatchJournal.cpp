@@ -73,10 +73,7 @@ BatchJournal::State BatchJournal::StateOf(const std::string& output, const Sourc
 
 void BatchJournal::NoteBegun(const std::string& output, const SourceMark& source, const std::string& settings,
                              const std::string& temporary) {
-    std::string birth = BirthOf(temporary);
-    if (birth.empty()) // complete already
-        birth = BirthOf(output);
-    Note(output, {false, TaskOf(source, settings), birth});
+    Note(output, {false, TaskOf(source, settings), BirthOf(temporary, output)});
 }
 
 void BatchJournal::NoteDone(const std::string& output, const SourceMark& source,

@@ -96,9 +96,8 @@ void ClipRun::Opened(const OpenedFile& news) {
             journal_.Begin();
             begun_ = true;
         } else if (keeps_) {
-            const std::string birth = BirthOf(news.temporaryPath);
             journal_.NoteFinished(closed_, {news.number - 1, news.begin},
-                                  birth.empty() ? BirthOf(news.path) : birth);
+                                  BirthOf(news.temporaryPath, news.path));
             worth_ = true;
         }
     } catch (const Failure& failure) {

@@ -15,4 +15,9 @@ std::string BirthOf(const std::string& path) {
                : fmt::format("{}", status.stx_ino);
 }
 
+std::string BirthOf(const std::string& temporary, const std::string& path) {
+    std::string birth = BirthOf(temporary);
+    return birth.empty() ? BirthOf(path) : birth;
+}
+
 } // namespace movieconv

@@ -10,6 +10,9 @@ namespace movieconv {
 /// it was made where that is told. Empty when there is none.
 std::string BirthOf(const std::string& path);
 
+/// Likewise, of an output that is called `temporary` until it is complete, and `path` from then on.
+std::string BirthOf(const std::string& temporary, const std::string& path);
+
 } // namespace movieconv
 
 #endif

@@ -2,6 +2,7 @@
 
 #include "host/window/model/JsonPath.h"
 #include "text/Path.h"
+#include "text/Printable.h"
 
 #include <QJsonArray>
 
@@ -74,10 +75,7 @@ QString Readable(const std::string& path) {
 QString Shown(const std::string& text) {
     QString shown = Readable(text);
     for (QChar& sign : shown) {
-        const char16_t code = sign.unicode();
-        const bool turns = (code >= 0x202A && code <= 0x202E) || (code >= 0x2066 && code <= 0x2069);
-        const bool endsLine = code == 0x2028 || code == 0x2029;
-        if (turns || endsLine || sign.category() == QChar::Other_Control)
+        if (sign == QLatin1Char('\t') || text::IsCommand(sign.unicode()))
             sign = QChar::ReplacementCharacter;
     }
     return shown;
