@@ -47,7 +47,8 @@ Tags TagsFor(const Container& container, Tags tags) {
 /// Zeroed memory of FFmpeg's, for `count` objects.
 template <class Type>
 Type* New(size_t count = 1) {
-    void* memory = av_calloc(count, sizeof(Type));
+    void* memory =
+        av_calloc(count, sizeof(Type)); // NOLINT(bugprone-sizeof-expression): arrays of pointers, too
     if (memory == nullptr)
         throw std::bad_alloc();
     return static_cast<Type*>(memory);

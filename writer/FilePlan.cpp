@@ -227,7 +227,7 @@ int64_t IndexSize(const FilePlan& plan, const VideoFormat* video, const AudioFor
     constexpr double kMost = 1e9;
     double length = 0;
     double perSecond = kPerSecond;
-    if (plan.pictures) {
+    if (plan.pictures && video != nullptr) {
         length = video->dDuration;
         perSecond += (plan.pictures->keepStamps ? kPerUnevenPicture : kPerPicture) *
                      std::max(av_q2d(plan.pictures->clock.rate),

@@ -109,7 +109,7 @@ int Mp4Room::Close(ByteFile& file) noexcept {
         uint8_t* header = &start[static_cast<size_t>(end)];
         for (int shift = 24; shift >= 0; shift -= 8)
             *header++ = static_cast<uint8_t>(size_ >> shift);
-        std::memcpy(header, "free", 4);
+        std::copy_n("free", 4, header);
         if (const int64_t result = WriteAt(file, 0, start.data(), end + kHeaderSize); result < 0)
             return static_cast<int>(-result);
         begin_ = end;

@@ -125,12 +125,12 @@ Preset LoadPreset(const std::string& nameOrFile) {
     Chain chain(nameOrFile);
     const auto& texts = chain.Texts();
     Json merged = Json::object();
-    for (auto text = texts.rbegin(); text != texts.rend(); ++text) {
+    std::for_each(texts.rbegin(), texts.rend(), [&merged](const auto& text) {
         merged.erase("description");
-        merged = MergePresets(merged, text->json);
+        merged = MergePresets(merged, text.json);
         merged.erase("parent");
         merged.erase("$schema");
-    }
+    });
     std::vector<std::string> toldAlready;
     Preset preset{nameOrFile, DescriptionIn(merged), {}, merged.dump(4), std::move(chain.Complaints())};
     preset.preferences = ReadPreferences({nameOrFile, merged, {}}, toldAlready);

@@ -47,9 +47,9 @@ int Inside(int begin, int size, int length) {
 
 class BitmapDrawer final : public CueDrawer {
 public:
-    BitmapDrawer(CueList list, const PictureStreamInfo& pictures)
+    BitmapDrawer(CueList list, PictureStreamInfo pictures)
         : list_(std::move(list)),
-          pictures_(pictures),
+          pictures_(std::move(pictures)),
           decoder_(avcodec_alloc_context3(avcodec_find_decoder(list_.parameters->codec_id))) {
         if (!decoder_)
             throw std::bad_alloc();

@@ -90,7 +90,7 @@ private:
         int stream;
         bool beside = false;
 
-        auto operator<=>(const Taker&) const = default;
+        auto operator<=>(const Taker&) const = default; // NOLINT(modernize-use-nullptr): it sees a 0
     };
 
     void Start();

@@ -90,6 +90,8 @@ bool MovieReader::Rewind() {
             start = stamp;
         }
     }
+    if (first == nullptr)
+        return toFirstByte();
     const int64_t earlier = start - av_rescale_q(1, {1, 1}, first->time_base);
     return avformat_seek_file(Context(), first->index, INT64_MIN, earlier, start, 0) >= 0 || toFirstByte();
 }

@@ -159,7 +159,9 @@ static void PausesAndStops(const std::wstring& folder) {
     const MCHandle converter = MCCreate(&pictures, nullptr);
     MCSetOutputFile(converter, (folder + L"/second.mp4").c_str());
     CHECK(MCStart(converter, 0.0, 0.0, nullptr, News::Take, &news) == 0);
-    CHECK(MCPause(converter) == 1 && MCPause(converter) == 2 && MCResume(converter) == 1);
+    CHECK(MCPause(converter) == 1);
+    CHECK(MCPause(converter) == 2);
+    CHECK(MCResume(converter) == 1);
     CHECK(MCWait(converter, 0) == MC_WAIT_TIMEOUT);
     CHECK(MCResume(converter) == 0);
     while (news.calls == 0)

@@ -5,6 +5,7 @@
 
 #include <gtest/gtest.h>
 
+#include <cstdio>
 #include <functional>
 #include <ostream>
 #include <stdexcept>
@@ -310,7 +311,7 @@ TEST(ParamForFile, IsChosenByTheExtension) {
     FileFormatInfo formats[4] = {};
     const auto fill = [](FileFormatInfo& format, const char* code, const char* extensions) {
         std::memcpy(&format.fccFormat, code, 4);
-        std::strcpy(format.szExtensions, extensions);
+        std::snprintf(format.szExtensions, sizeof format.szExtensions, "%s", extensions);
         format.bHasAudio = 1;
     };
     fill(formats[0], "MP4 ", "mp4,m4v");

@@ -50,7 +50,8 @@ TEST(SpeedMeter, FollowsTheLastTenSeconds) {
 std::optional<ByteRange> Foretell(double seconds, double rate(double position)) {
     SizeForecast forecast;
     double bytes = 5000; // the head
-    for (double position = 0; position <= seconds; position += 0.5) {
+    for (int step = 0; step <= 2 * seconds; ++step) {
+        const double position = step / 2.0;
         forecast.Add(position, static_cast<int64_t>(bytes));
         bytes += rate(position) / 2;
     }
@@ -59,7 +60,8 @@ std::optional<ByteRange> Foretell(double seconds, double rate(double position)) 
 
 TEST(SizeForecast, TakesNoWaitForALumpForAnEnd) {
     SizeForecast forecast;
-    for (double position = 0; position <= 24; position += 0.5) {
+    for (int step = 0; step <= 48; ++step) {
+        const double position = step / 2.0;
         const double written = std::floor(position / 5) * 5; // seconds
         forecast.Add(position, static_cast<int64_t>(5000 + written * 1000));
         if (const auto range = forecast.Total(100)) {

@@ -13,7 +13,10 @@ using namespace image;
 
 class LevelChoiceTest : public testing::Test {
 protected:
-    LevelChoiceTest() : before(std::getenv(kLevelVariable) ? std::getenv(kLevelVariable) : "") {}
+    LevelChoiceTest() {
+        if (const char* level = std::getenv(kLevelVariable))
+            before = level;
+    }
     ~LevelChoiceTest() override {
         if (before.empty())
             unsetenv(kLevelVariable);
@@ -33,7 +36,7 @@ protected:
     }
 
 private:
-    const std::string before;
+    std::string before;
 };
 
 TEST_F(LevelChoiceTest, TheVariableNamesOneOfThoseThatThereAre) {

@@ -104,12 +104,11 @@ TEST(Filters, BringHdrToTheLightOfUsualDisplays) {
 
 /// A movie whose second half only shows all of the picture between the borders.
 std::string Letterboxed() {
-    return Make(
-        "letterboxed.mkv",
-        {"-f", "lavfi", "-i",
-         "color=black:s=320x240:r=25:d=8,format=yuv420p,geq=lum='if(between(Y,36,199)*between(X,10,299)*"
-         "gte(N,if(lt(X,150),20,120)),60+mod(X+Y,120),16)':cb=128:cr=128",
-         "-c:v", "libx264", "-g", "10", "-qp", "10"});
+    const std::string pictures =
+        "color=black:s=320x240:r=25:d=8,format=yuv420p,geq=lum='if(between(Y,36,199)*between(X,10,299)*"
+        "gte(N,if(lt(X,150),20,120)),60+mod(X+Y,120),16)':cb=128:cr=128";
+    return Make("letterboxed.mkv",
+                {"-f", "lavfi", "-i", pictures, "-c:v", "libx264", "-g", "10", "-qp", "10"});
 }
 
 TEST(Borders, AreFoundAllOverTheMovieUpright) {

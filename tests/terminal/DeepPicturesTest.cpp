@@ -78,7 +78,7 @@ TEST(DeepPictures, AreHandedOutWithTheirBitsUprightOrTurned) {
                 const auto at = [&](int place) {
                     return turned ? At(*image, 0, 8, 255 - place) : At(*image, 0, place, 8);
                 };
-                EXPECT_NEAR(at(x), (64 + x * 876 / 255) / (deep ? 1 : 4), deep ? 4 : 2);
+                EXPECT_NEAR(at(x), (64 + x * 876 / 255.0) / (deep ? 1 : 4), deep ? 4 : 2);
                 levels += at(x) != at(x - 1) ? 1 : 0;
             }
             EXPECT_GT(levels, deep ? 240 : 180);
@@ -91,8 +91,8 @@ void ExpectRamp(const std::string& path, int black, int slope) {
     const VideoImage* image = movie.Pictures()->GetCurrentImage();
     ASSERT_NE(image, nullptr);
     for (int x = 4; x < 252; x += 4) {
-        EXPECT_NEAR(At(*image, 0, x, 8), black + x * slope / 255, slope / 30) << x;
-        EXPECT_NEAR(At(*image, 1, x / 2, 4), black * 8, black / 4) << x;
+        EXPECT_NEAR(At(*image, 0, x, 8), black + x * slope / 255.0, slope / 30.0) << x;
+        EXPECT_NEAR(At(*image, 1, x / 2, 4), black * 8, black / 4.0) << x;
     }
 }
 

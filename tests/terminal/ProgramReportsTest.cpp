@@ -239,12 +239,14 @@ bool IsPlainText(const std::string& text) {
     const auto holds = [&text](const char* part) { return text.find(part) != std::string::npos; };
     return std::none_of(text.begin(), text.end(),
                         [](unsigned char c) { return (c < 0x20 && c != '\n') || c == 0x7F; }) &&
-           !holds("\xC2\x9B") && !holds("\xE2\x80\xAE") && text::ToUtf8(text::FromUtf8(text)) == text;
+           !holds("\xC2\x9B") && !holds("\xE2\x80\xAE") && // NOLINT(misc-misleading-bidirectional)
+           text::ToUtf8(text::FromUtf8(text)) == text;
 }
 
 // Tags, titles, chapters and names of files are whoever's who made the movie.
 TEST(Program, ShowsNoTextOfOthersThatTerminalsObey) {
     const Folder folder;
+    // NOLINTNEXTLINE(misc-misleading-bidirectional)
     const std::string evil = "\x1b]0;owned\x07\xC2\x9b"
                              "2J\xE2\x80\xAE\x7f";
     const std::string description = Part("evil-texts", ";FFMETADATA1\ntitle=" + evil +

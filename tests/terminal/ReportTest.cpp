@@ -30,7 +30,8 @@ TEST(ProgressText, FitsTheTerminalAndNeverRoundsUp) {
 TEST(JsonString, EscapesWhatJsonDoesNotTake) {
     EXPECT_EQ(JsonString("a\"b\\c\n\x01"), "\"a\\\"b\\\\c\\u000a\\u0001\"");
     EXPECT_EQ(JsonString("ф\xff"), "\"ф\xEF\xBF\xBD\"");
-    EXPECT_EQ(JsonString("\x7f\xC2\x9b\xE2\x80\xAE"), "\"\\u007f\\u009b\\u202e\"");
+    EXPECT_EQ(JsonString("\x7f\xC2\x9b\xE2\x80\xAE"), // NOLINT(misc-misleading-bidirectional)
+              "\"\\u007f\\u009b\\u202e\"");
     EXPECT_EQ(EscapeCommands("{\n \"ф\": \"\xC2\x9b\"}"), "{\n \"ф\": \"\\u009b\"}");
 }
 

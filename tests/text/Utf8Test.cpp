@@ -63,6 +63,7 @@ TEST(Printable, IsOneLineThatNoTerminalObeys) {
     EXPECT_EQ(text::Printable("\xC2\x9b"
                               "1m"),
               "\\u009b1m");
+    // NOLINTNEXTLINE(misc-misleading-bidirectional)
     EXPECT_EQ(text::Printable("gpj\xE2\x80\xAE.exe\xE2\x81\xA6"), "gpj\\u202e.exe\\u2066");
     EXPECT_EQ(text::Printable("\x9b"
                               "1m\xff"),

@@ -2,6 +2,7 @@
 #include "host/window/desktop/Desktop.h"
 #include "host/window/desktop/Instance.h"
 #include "tests/window/ScriptedRunner.h"
+#include "tests/window/StandIns.h"
 
 #include <gtest/gtest.h>
 
@@ -18,78 +19,6 @@
 using namespace movieconv::window;
 
 namespace {
-
-/// Everything of a desktop that the window speaks to.
-class Desktop : public QObject {
-    Q_OBJECT
-public:
-    QStringList calls;
-    QVariantMap hints;
-    QDBusUnixFileDescriptor lock; ///< Handed out to who keeps the machine awake.
-};
-
-class Login : public QObject {
-    Q_OBJECT
-    Q_CLASSINFO("D-Bus Interface", "org.freedesktop.login1.Manager")
-public:
-    explicit Login(Desktop& desktop) : desktop_(desktop) {}
-public Q_SLOTS:
-    QDBusUnixFileDescriptor Inhibit(const QString& what, const QString&, const QString&,
-                                    const QString& mode) {
-        desktop_.calls += QStringLiteral("inhibit ") + what + QLatin1Char(' ') + mode;
-        return std::exchange(desktop_.lock, {});
-    }
-    void Suspend(bool asking) {
-        desktop_.calls += asking ? QStringLiteral("suspend, asking") : QStringLiteral("suspend");
-    }
-
-private:
-    Desktop& desktop_;
-};
-
-class Notifications : public QObject {
-    Q_OBJECT
-    Q_CLASSINFO("D-Bus Interface", "org.freedesktop.Notifications")
-public:
-    explicit Notifications(Desktop& desktop) : desktop_(desktop) {}
-public Q_SLOTS:
-    uint Notify(const QString&, uint replaced, const QString&, const QString& title, const QString& text,
-                const QStringList&, const QVariantMap& hints, int) {
-        desktop_.calls += QStringLiteral("notify %1 %2: %3").arg(replaced).arg(title, text);
-        desktop_.hints = hints;
-        return 7;
-    }
-Q_SIGNALS:
-    void ActionInvoked(uint id, const QString& action);
-
-private:
-    Desktop& desktop_;
-};
-
-class FileManager : public QObject {
-    Q_OBJECT
-    Q_CLASSINFO("D-Bus Interface", "org.freedesktop.FileManager1")
-public:
-    explicit FileManager(Desktop& desktop) : desktop_(desktop) {}
-public Q_SLOTS:
-    void ShowItems(const QStringList& addresses, const QString&) {
-        desktop_.calls += QStringLiteral("show ") + addresses.join(QLatin1Char(' '));
-    }
-
-private:
-    Desktop& desktop_;
-};
-
-class Portal : public QObject {
-    Q_OBJECT
-    Q_CLASSINFO("D-Bus Interface", "org.freedesktop.portal.Settings")
-public Q_SLOTS:
-    QDBusVariant Read(const QString&, const QString&) {
-        return QDBusVariant(QVariant::fromValue(QDBusVariant(1U)));
-    }
-Q_SIGNALS:
-    void SettingChanged(const QString& space, const QString& key, const QDBusVariant& value);
-};
 
 /// The stand-ins, under the names of those that they stand for.
 struct OnABus : testing::Test {
@@ -201,5 +130,3 @@ TEST_F(OnABus, LightAndDarkFollowTheDesktop) {
     }));
     EXPECT_FALSE(told.takeFirst()[0].toBool());
 }
-
-#include "DesktopTest.moc"

@@ -2,4 +2,4 @@
 #define MOVIECONV_PERMUTE_PAIRS
 #undef kAvx512Kernels // another name in the emulation
 #define kAvx512Kernels kAvx512PairsKernels
-#include "Common/Image/kernels/RowKernelsAvx512.cpp"
+#include "Common/Image/kernels/RowKernelsAvx512.cpp" // NOLINT(bugprone-suspicious-include): once more
