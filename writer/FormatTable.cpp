@@ -76,7 +76,7 @@ constexpr std::array kPictureCodecs{
     PictureCodec{kFfv1,  AV_CODEC_ID_FFV1,       "ffv1",       kPlanar,     true,  false, 1.0, kNoQuality, kOneSpeed, kNotAhead, kFfv1Options},
     PictureCodec{kMpeg2, AV_CODEC_ID_MPEG2VIDEO, "mpeg2video", kPlanar,     false, false, 0.0, kQuantiser, kOneSpeed, kNotAhead, ""},
     PictureCodec{kFlv1,  AV_CODEC_ID_FLV1,       "flv",        kPlanar,     false, false, 0.0, kQuantiser, kOneSpeed, kNotAhead, ""},
-    PictureCodec{kGif,   AV_CODEC_ID_GIF,        "gif",        kPalette,    false, false, 0.0, kNoQuality, kOneSpeed, kNotAhead, ""},
+    PictureCodec{kGif,   AV_CODEC_ID_GIF,        "gif",        kPalette,    false, false, 0.0, kNoQuality, kOneSpeed, kNotAhead, "", 600},
 };
 
 // The limits of AAC are the format's (6144 bits for a frame of 1024 samples), those of the others their encoders'.

@@ -53,6 +53,7 @@ struct PictureCodec {
     /// 0: none, or it cannot be told after which picture to cut.
     std::array<int, 7> looksAhead;
     const char* options; ///< For the encoder in any case, as "name=value,...".
+    int longest = 0; ///< Seconds that a picture can be shown before it has to be there again; 0: any time.
 };
 
 /// A codec for sound.

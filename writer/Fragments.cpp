@@ -9,8 +9,10 @@
 #include <array>
 #include <cerrno>
 #include <cstdio>
+#include <functional>
 #include <new>
 #include <optional>
+#include <vector>
 
 namespace writer {
 namespace {
@@ -122,6 +124,24 @@ bool IsText(const PacketWriter& written, int stream) {
            written.Stream(stream).description.parameters->codec_id == AV_CODEC_ID_MOV_TEXT;
 }
 
+/// Calls `take` with all packets. In fragments a picture lasts until the next one is decoded, which may be
+/// long after the last one was shown.
+void ForEachPacket(const FragmentLog& log, const PacketWriter& written,
+                   const std::function<void(const PlacedPacket&)>& take) {
+    std::vector<int64_t> ends;
+    for (int stream = 0; stream < written.StreamCount(); ++stream) {
+        const PacketWriter::Written taken = written.Stream(stream);
+        ends.push_back(taken.end + taken.delay);
+    }
+    log.ForEach([&](PlacedPacket packet) {
+        if (packet.stream < 0 || static_cast<size_t>(packet.stream) >= ends.size())
+            ThrowIncomplete();
+        if (const int64_t left = ends[static_cast<size_t>(packet.stream)] - packet.pts; left > 0)
+            packet.duration = std::min(packet.duration, left);
+        take(packet);
+    });
+}
+
 /// Gives the texts to the index, before all else: the multiplexer puts samples of its own wherever the times
 /// of another stream pass a text's end. They have no place in the file.
 TextRows AddTexts(const FragmentLog& log, const PacketWriter& written, int64_t size, Mp4Index& index) {
@@ -133,9 +153,8 @@ TextRows AddTexts(const FragmentLog& log, const PacketWriter& written, int64_t s
     if (!text)
         return rows;
     int64_t end = 0;
-    log.ForEach([&](const PlacedPacket& packet) {
-        if (packet.position + packet.size > size || packet.stream < 0 ||
-            packet.stream >= written.StreamCount())
+    ForEachPacket(log, written, [&](const PlacedPacket& packet) {
+        if (packet.position + packet.size > size)
             ThrowIncomplete();
         if (IsText(written, packet.stream))
             rows.Add(packet);
@@ -179,7 +198,7 @@ void FinishFragments(const std::shared_ptr<ByteFile>& part, const PacketWriter& 
         Mp4Index index(container, bitExact, extras, place);
         AddStreams(*input, written, index);
         const TextRows texts = AddTexts(log, written, end, index);
-        log.ForEach([&](const PlacedPacket& packet) {
+        ForEachPacket(log, written, [&](const PlacedPacket& packet) {
             if (IsText(written, packet.stream))
                 return;
             if (packet.position + packet.size > end)

@@ -289,6 +289,7 @@ Muxer::Written Muxer::Stream(int stream) const {
              state.carriage, state.label, state.light},
             state.delay,
             state.packets,
+            av_rescale_q(state.endPts, state.unit, out->time_base),
             static_cast<double>(std::max<int64_t>(0, length)) * av_q2d(state.unit)};
 }
 

@@ -33,6 +33,7 @@ public:
         MuxedStream description; ///< In the file's unit.
         int64_t delay; ///< By how much times in the file are later than those that came, in that unit.
         int64_t packets;
+        int64_t end;    ///< Of the last packet, in that unit, as it came.
         double seconds; ///< From the start of the first packet to the end of the last, without run-up.
     };
 

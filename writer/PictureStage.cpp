@@ -87,8 +87,9 @@ void PictureStage::Cut() {
 void PictureStage::Show(av::Frame picture, const PicturePacer::Showing& showing) {
     if (!picture)
         return;
+    const int64_t repeated = showing.count > 0 ? RepeatUntil(showing.tick) : 0;
     if (!isCut_)
-        shown_(showing.count);
+        shown_(repeated + showing.count);
     if (showing.count == 0)
         return;
     picture = scaler_.Convert(std::move(picture));
@@ -96,6 +97,19 @@ void PictureStage::Show(av::Frame picture, const PicturePacer::Showing& showing)
         picture = palette_.Convert(std::move(picture));
     for (int64_t i = 0; i < showing.count; ++i)
         encoder_.Encode(*picture, showing.tick + i * plan_.clock.ticksPerPicture, take_);
+    if (plan_.codec->longest > 0) {
+        lastTick_ = showing.tick + (showing.count - 1) * plan_.clock.ticksPerPicture;
+        last_ = std::move(picture);
+    }
+}
+
+/// Shows the last picture again for as long as the file cannot say; returns how often.
+int64_t PictureStage::RepeatUntil(int64_t tick) {
+    const int64_t longest = av_rescale_q(plan_.codec->longest, {1, 1}, plan_.clock.tick);
+    int64_t count = 0;
+    for (; last_ && tick - lastTick_ > longest; ++count)
+        encoder_.Encode(*last_, lastTick_ += longest, take_);
+    return count;
 }
 
 } // namespace writer

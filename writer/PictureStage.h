@@ -43,6 +43,7 @@ private:
     void Run();
     void Cut();
     void Show(av::Frame picture, const PicturePacer::Showing& showing);
+    int64_t RepeatUntil(int64_t tick);
 
     const PicturePlan& plan_;
     PictureEncoder encoder_;
@@ -52,6 +53,8 @@ private:
     FramePool pool_;       ///< Used by Push only.
     PacketTaker take_;
     Shown shown_;
+    av::Frame last_; ///< The picture shown last, where it may have to be shown again, and its last tick.
+    int64_t lastTick_ = 0;
     bool isCut_ = false; ///< What comes now is behind the piece.
     StageThread<av::Frame> thread_;
 };

@@ -217,7 +217,7 @@ PacketWriter::Written PieceWriter::Stream(int stream) const {
     const State& state = streams_[static_cast<std::size_t>(stream)];
     const int64_t length =
         state.packets > 0 ? state.end - state.begin - state.parameters->initial_padding : 0;
-    return {state.description, 0, state.packets,
+    return {state.description, 0, state.packets, state.end,
             static_cast<double>(std::max<int64_t>(0, length)) * av_q2d(state.description.unit)};
 }
 

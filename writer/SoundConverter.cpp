@@ -44,6 +44,11 @@ void Repack(const PcmFormat& format, int channels, const uint8_t* data, int fram
             std::copy_n(data + channel * fromSize, fromSize, to);
 }
 
+/// At least as many sample frames as the resampler's filter takes in.
+int LongestFilter(int from, int to) {
+    return 64 + 64 * (from / to);
+}
+
 [[noreturn]] void ThrowUnconvertible(const PcmFormat& format, int error) {
     av::CheckMemory(error);
     throw WriterFailure(kWriterErrorEncode, "Sound of " + std::to_string(format.rate) + " Hz with " +
@@ -120,15 +125,18 @@ av::Frame SoundConverter::Take(int samples) {
 void SoundConverter::Prepare(const PcmFormat& format) {
     Finish();
     av::ChannelLayout source(UsedChannels(format));
-    SwrContext* made = nullptr;
-    int error = swr_alloc_set_opts2(&made, layout_.Get(), format_, rate_, source.Get(),
+    SwrContext* context = nullptr;
+    int error = swr_alloc_set_opts2(&context, layout_.Get(), format_, rate_, source.Get(),
                                     SampleFormatOf(format.bits), format.rate, 0, nullptr);
-    resampler_.reset(made);
+    av::Resampler resampler(context);
     if (error >= 0)
-        error = swr_init(made);
+        error = swr_init(context);
     if (error < 0)
         ThrowUnconvertible(format, error);
+    resampler_ = std::move(resampler);
     source_ = format;
+    pushed_ = 0;
+    made_ = 0;
 }
 
 void SoundConverter::Convert(const uint8_t* data, int frames) {
@@ -141,27 +149,38 @@ void SoundConverter::Convert(const uint8_t* data, int frames) {
     const uint8_t* const input[AV_NUM_DATA_POINTERS] = {data};
     const int made = swr_convert(resampler_.get(), frame->extended_data, frame->nb_samples,
                                  const_cast<const uint8_t**>(input), frames);
+    pushed_ += frames;
+    Keep(frame, made);
+}
+
+/// Appends what the resampler made, if it made anything.
+void SoundConverter::Keep(const av::Frame& frame, int made) {
     if (made < 0)
         ThrowUnconvertible(source_, made);
     if (av_audio_fifo_write(fifo_.get(), reinterpret_cast<void**>(frame->extended_data), made) < made)
         throw std::bad_alloc();
+    made_ += made;
 }
 
 void SoundConverter::Drain() {
     if (!resampler_)
         return;
-    for (;;) {
+    // Sound that is shorter than its filter the resampler would not give out: silence makes it long enough.
+    int64_t most = INT64_MAX;
+    if (made_ == 0) {
+        most = av_rescale_rnd(pushed_, rate_, source_.rate, AV_ROUND_UP);
+        if (swr_inject_silence(resampler_.get(), LongestFilter(source_.rate, rate_)) < 0)
+            throw std::bad_alloc();
+    }
+    while (made_ < most) {
         const int left = swr_get_out_samples(resampler_.get(), 0);
         if (left <= 0)
             break;
         const av::Frame frame = NewFrame(left);
         const int made = swr_convert(resampler_.get(), frame->extended_data, left, nullptr, 0);
-        if (made < 0)
-            ThrowUnconvertible(source_, made);
+        Keep(frame, static_cast<int>(std::min<int64_t>(made, most - made_)));
         if (made == 0)
             break;
-        if (av_audio_fifo_write(fifo_.get(), reinterpret_cast<void**>(frame->extended_data), made) < made)
-            throw std::bad_alloc();
     }
     resampler_.reset();
 }

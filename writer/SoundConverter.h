@@ -53,6 +53,7 @@ private:
     void Prepare(const PcmFormat& format);
     void Convert(const uint8_t* data, int frames);
     void Drain();
+    void Keep(const av::Frame& frame, int made);
     av::Frame NewFrame(int samples) const;
 
     const int rate_;
@@ -60,6 +61,8 @@ private:
     const AVSampleFormat format_;
     PcmFormat source_;
     av::Resampler resampler_;
+    int64_t pushed_ = 0; ///< Sample frames that went into the resampler,
+    int64_t made_ = 0;   ///< and that came out of it.
     av::SampleFifo fifo_;
     std::vector<uint8_t> rest_;     ///< Bytes that do not fill a sample frame yet.
     std::vector<uint8_t> repacked_; ///< Samples as the resampler takes them.

@@ -122,6 +122,31 @@ TEST(Pictures, StampsOfAVariableRateAreKept) {
         EXPECT_NEAR(read.pictures[i].time, static_cast<double>(times[i]) / 1e7, 0.0002);
 }
 
+TEST(Pictures, LastThroughALongPause) {
+    struct {
+        uint32_t codec, format;
+        size_t pictures;
+    } const cases[] = {
+        {FourCC("H264"), FourCC("MP4 "), 10}, // decodes pictures before others that are shown earlier
+        {FourCC("GIF "), FourCC("GIF "), 12}, // shows a picture for 655 seconds at most
+    };
+    for (const auto& [codec, format, pictures] : cases) {
+        TestMovie movie = WithoutSound();
+        movie.param.fccVideo = codec;
+        movie.param.fccFileFormat = format;
+        const ReadMovie read = WriteAndRead(movie, [](void* file) {
+            TestPicture picture(160, 120);
+            for (int number = 0; number < 10; ++number) {
+                const int64_t pause = number < 5 ? 0 : 1300 * int64_t{kTicksPerSecond};
+                EXPECT_EQ(MWWriteVideoFrame(file, &picture.Paint(number, pause + number * 400'000)), 1);
+            }
+        });
+        ASSERT_EQ(read.pictures.size(), pictures) << codec;
+        EXPECT_NEAR(read.pictures[pictures - 5].time, 1300.2, 0.01) << codec;
+        EXPECT_NEAR(read.duration, 1300.4, 0.05) << codec;
+    }
+}
+
 TEST(Pictures, TooManyForASteadyRateAreLeftOut) {
     TestMovie movie = WithoutSound();
     movie.param.fccFileFormat = FourCC("AVI ");

@@ -4,7 +4,9 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cmath>
+#include <cstdint>
 #include <vector>
 
 namespace {
@@ -89,6 +91,24 @@ TEST(Sound, AFormatThatChangesOnTheWayLosesNothing) {
         EXPECT_EQ(MWWriteAudioData(file, &slow.Next(500, 0)), 1);
     });
     EXPECT_NEAR(static_cast<double>(read.samples), 88200 + 5 * 44100, 441);
+}
+
+TEST(Sound, ShorterThanTheResamplersFilterIsKept) {
+    for (const int rate : {1, 8000, 192'000}) {
+        constexpr int kSamples = 20;
+        const ReadMovie read = WriteAndRead(PcmMovie(), [&](void* file) {
+            TestSound usual(44100, 2, 16);
+            MWWriteAudioData(file, &usual.Next(4410, 0));
+            TestSound other(rate, 1, 16);
+            AudioFrame piece = other.Next(kSamples, 0);
+            std::fill_n(reinterpret_cast<int16_t*>(piece.pData), kSamples, int16_t{0x4000});
+            MWWriteAudioData(file, &piece);
+        });
+        const int expected = (kSamples * 44100 + rate - 1) / rate;
+        ASSERT_NEAR(static_cast<double>(read.samples), 4410 + expected, 1) << rate;
+        EXPECT_NEAR(read.firstChannel[4410 + static_cast<size_t>(expected) / 2], 0.5 * M_SQRT1_2, 0.05)
+            << rate;
+    }
 }
 
 TEST(Sound, BlocksThatSplitASampleAreJoined) {
