@@ -95,7 +95,8 @@ void FileFinisher::Abandon() {
                      FailureOf(std::current_exception()).what());
         }
     }
-    part_.CutToWhole();
+    if (part_.CutToWhole() == 0)
+        part_.Remove();
 }
 
 void FileFinisher::Progress(double share) {

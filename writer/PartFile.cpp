@@ -84,12 +84,13 @@ void PartFile::WriteTrailer() {
         throw WriterFailure(kWriterErrorWrite, "");
 }
 
-void PartFile::CutToWhole() {
+int64_t PartFile::CutToWhole() {
     io_->Flush();
     const int64_t size = io_->Size();
     const int64_t whole = fragmented_ ? WholeFragments(*File(), size) : packets_->WholeSize(size);
-    const bool cut = whole < size && File()->Truncate(whole) >= 0;
-    record_->Update([&](WriterStatus& status) { status.llBytesWritten = cut ? whole : size; });
+    const int64_t left = whole < size && File()->Truncate(whole) >= 0 ? whole : size;
+    record_->Update([left](WriterStatus& status) { status.llBytesWritten = left; });
+    return left;
 }
 
 void PartFile::Remove() {

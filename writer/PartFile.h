@@ -47,8 +47,8 @@ public:
     /// What is left, out to the disk. Throws WriterFailure.
     void WriteTrailer();
 
-    /// Cuts off what has begun and never ended, for want of room, memory or an end.
-    void CutToWhole();
+    /// Cuts off what has begun and never ended, for want of room, memory or an end. Returns the size.
+    int64_t CutToWhole();
 
     void Remove();
 

@@ -87,8 +87,13 @@ bool FileLedger::Enter(const WriterWatch::News& news) {
     default:
         break;
     }
-    if (news.status.nError != kWriterErrorNone && wasWell && !failure_)
+    if (news.status.nError != kWriterErrorNone && !failure_) {
         failure_.emplace(CategoryOf(news.status.nError), TextOf(news.status), ReasonOf(news.status.nError));
+        failed_ = news.status.szPath;
+    }
+    // What remains of the file is known now.
+    if (news.event == kWriterEventClosed && !failed_.empty() && failed_ == news.status.szPath)
+        failure_.emplace(failure_->Kind(), TextOf(news.status), failure_->Why());
     return !(wasWell && failure_);
 }
 

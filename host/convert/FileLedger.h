@@ -52,6 +52,7 @@ private:
     int64_t bytes_ = 0;
     std::optional<double> finishing_;
     std::optional<Failure> failure_;
+    std::string failed_; ///< The file whose failure it is, if it is one's.
 };
 
 } // namespace movieconv

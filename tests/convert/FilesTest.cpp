@@ -174,6 +174,9 @@ TEST(FileLedger, KeepsTheFirstFailure) {
         for (const std::string& part : {folder / "o", std::string("o.part")})
             EXPECT_NE(ledger.FirstFailure()->Text().find(part), std::string::npos) << part;
         EXPECT_EQ(ledger.Complete(), 0);
+        status.szTemporaryPath[0] = '\0'; // it was empty
+        EXPECT_TRUE(ledger.Enter({kWriterEventClosed, status, {}}));
+        EXPECT_EQ(ledger.FirstFailure()->Text().find("o.part"), std::string::npos);
     }
 }
 

@@ -199,6 +199,9 @@ TEST_P(FaultIn, EveryWriteIsToldAndLeavesAPlayablePart) {
         if (created_) {
             EXPECT_EQ(status.nState, kWriterFileFailed);
             EXPECT_EQ(events_, (std::vector<int>{kWriterEventFailed, kWriterEventClosed}));
+        }
+        EXPECT_EQ(*status.szTemporaryPath != '\0', status.llBytesWritten > 0);
+        if (status.llBytesWritten > 0) {
             EXPECT_EQ(status.llBytesWritten,
                       static_cast<int64_t>(std::filesystem::file_size(status.szTemporaryPath)));
             const std::vector<std::string> part = Packets(status.szTemporaryPath);
