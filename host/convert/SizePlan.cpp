@@ -104,7 +104,7 @@ Request FitIntoSize(Request request, const SourceInfo& source) {
     const double share = free / length * (pictures ? kMostSoundShare : 1 / kSoundSpread) / tracks;
     const double soundRate = sound ? tracks * FitSound(request, format, *source.sound, share) : 0;
     const double pictureRate = (free - soundRate * length) / (length + kBufferSeconds);
-    if (pictureRate < (pictures ? kLeastPictureRate : 0)) {
+    if (pictureRate < (pictures ? kLeastPictureRate : -1)) { // sound alone takes all but what rounding leaves
         throw Failure(
             Category::kRequest,
             fmt::format("{} are too little for {}", FormatBytes(*request.maxSize), FormatTime(length, true)));

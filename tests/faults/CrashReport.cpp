@@ -68,7 +68,8 @@ void ReportCrashes() {
 }
 
 bool IsKnownCrash(const std::string& output) {
-    constexpr std::array kCrashing{" avcodec_alloc_context3 ", " swr_convert ", " av_write_trailer "};
+    constexpr std::array kCrashing{" avcodec_alloc_context3 ", " avcodec_open2 ", " swr_convert ",
+                                   " av_write_trailer "};
     constexpr std::array kHiding{" avcodec_open2 "};
     constexpr std::array kFirstPicture{" avcodec_send_frame ", " avcodec_send_packet "};
     return Names(output, "Crash:", kCrashing) ||
