@@ -28,6 +28,8 @@ struct Cover {
     int width = 0;
     int height = 0;
     Bytes data;
+    std::string fileName; ///< Empty: the usual one.
+    std::string description;
 };
 
 struct Attachment {

@@ -104,10 +104,13 @@ void ExtrasMuxer::AddAttachments(AVFormatContext& output) const {
         if (!description.empty()) // or it would be there, and say nothing
             SetTags(made.metadata, {{"title", description}});
     };
-    if (extras_.cover.codec == AV_CODEC_ID_PNG)
-        add("cover.png", "image/png", extras_.cover.data);
-    else if (extras_.cover.codec == AV_CODEC_ID_MJPEG)
-        add("cover.jpg", "image/jpeg", extras_.cover.data);
+    if (const Cover& cover = extras_.cover; cover.codec != AV_CODEC_ID_NONE) {
+        const bool png = cover.codec == AV_CODEC_ID_PNG;
+        add(!cover.fileName.empty() ? cover.fileName
+            : png                   ? "cover.png"
+                                    : "cover.jpg",
+            png ? "image/png" : "image/jpeg", cover.data, cover.description);
+    }
     for (const Attachment& attachment : extras_.attachments)
         add(attachment.fileName, attachment.mimeType, attachment.data, attachment.description);
 }
@@ -123,6 +126,8 @@ void ExtrasMuxer::AddCover(AVFormatContext& output) {
     made.codecpar->height = extras_.cover.height;
     made.disposition = AV_DISPOSITION_ATTACHED_PIC;
     SetTags(made.metadata, {{"comment", "Cover (front)"}}); // what kind of picture it is
+    if (!extras_.cover.description.empty())
+        SetTags(made.metadata, {{"title", extras_.cover.description}});
     made.time_base = {1, 90000};
     coverStream_ = made.index;
 }

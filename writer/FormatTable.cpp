@@ -96,6 +96,7 @@ using enum ContainerKind;
 constexpr uint32_t kTags = kWriterFormatTags;
 constexpr uint32_t kChapters = kWriterFormatChapters;
 constexpr uint32_t kCover = kWriterFormatCover;
+constexpr uint32_t kCoverText = kWriterFormatCoverText;
 constexpr uint32_t kFiles = kWriterFormatAttachments;
 constexpr uint32_t kTracks = kWriterFormatTracks;
 constexpr uint32_t kLanguages = kWriterFormatLanguages;
@@ -138,12 +139,12 @@ constexpr std::array kContainers{
               kTags | kChapters | kTracks | kLanguages | kTitles | kTimecode, kMovTags, kNoFlags, kMp4Subtitles, kMovSound, kLanguageTags | kShortTags,
               {kXvid, kH264, kHevc, kMjpg, kMpeg2}, {kAac, kMp3, kAc3, kAlac, kPcm}},
     Container{FourCC("MKV "), "Matroska", "mkv", "matroska", kStreamed, kClusters,
-              kTags | kChapters | kCover | kFiles | kTracks | kLanguages | kTitles | kTimecode, kAnyTags, kMatroskaFlags,
+              kTags | kChapters | kCover | kCoverText | kFiles | kTracks | kLanguages | kTitles | kTimecode, kAnyTags, kMatroskaFlags,
               kMatroskaSubtitles, kMatroskaSound, kLanguageTags,
               {kXvid, kH264, kHevc, kMjpg, kVp8, kVp9, kMpeg2, kFlv1, kAv1, kFfv1},
               {kAac, kMp3, kAc3, kFlac, kOpus, kVorbis, kAlac, kMp2, kPcm}},
     Container{FourCC("MKA "), "Matroska audio", "mka", "matroska", kStreamed, kClusters,
-              kTags | kChapters | kCover | kFiles | kTracks | kLanguages | kTitles, kAnyTags, kMatroskaFlags,
+              kTags | kChapters | kCover | kCoverText | kFiles | kTracks | kLanguages | kTitles, kAnyTags, kMatroskaFlags,
               kMatroskaSubtitles, kMatroskaSound, kLanguageTags,
               {},
               {kAac, kMp3, kAc3, kFlac, kOpus, kVorbis, kAlac, kMp2, kPcm}},
@@ -166,11 +167,11 @@ constexpr std::array kContainers{
               kTags | kChapters | kCover | kTracks | kLanguages, kMp4Tags, kNoFlags, kMp4Subtitles, "aac,alac,ac3,eac3", kLanguageTags,
               {}, {kAac, kAc3, kAlac}},
     Container{FourCC("MP3 "), "MP3", "mp3", "mp3", kStreamed, nullptr,
-              kTags | kCover, kAnyTags, kNoFlags, nullptr, "mp3", 0, {}, {kMp3}},
+              kTags | kCover | kCoverText, kAnyTags, kNoFlags, nullptr, "mp3", 0, {}, {kMp3}},
     Container{FourCC("WAV "), "WAV (RIFF wave)", "wav", "wav", kSteadyRate, "rf64=auto",
               kTags, kRiffTags, kNoFlags, nullptr, kWavSound, 0, {}, {kPcm, kMp3, kAc3}},
     Container{FourCC("FLAC"), "FLAC", "flac", "flac", kStreamed, nullptr,
-              kTags | kCover, kAnyTags, kNoFlags, nullptr, "flac", kOneComment, {}, {kFlac}},
+              kTags | kCover | kCoverText, kAnyTags, kNoFlags, nullptr, "flac", kOneComment, {}, {kFlac}},
     Container{FourCC("OGG "), "Ogg", "ogg,oga,opus", "ogg", kStreamed, nullptr,
               kTags | kLanguages | kChapterTexts, kAnyTags, kNoFlags, nullptr, "vorbis,opus,flac,speex", kTagsInStream | kOneComment, {}, {kVorbis, kOpus, kFlac}},
 };

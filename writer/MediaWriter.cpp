@@ -281,6 +281,14 @@ int MWSetCover(uint32_t set, const void* data, int64_t size) {
     });
 }
 
+int MWDescribeCover(uint32_t set, const char* fileName, const char* description) {
+    return ChangeExtras(set, [&](Extras& extras) {
+        extras.cover.fileName = fileName != nullptr ? fileName : "";
+        extras.cover.description = description != nullptr ? description : "";
+        return extras.cover.codec != AV_CODEC_ID_NONE;
+    });
+}
+
 int MWAddAttachment(uint32_t set, const char* fileName, const char* mimeType, const void* data,
                     int64_t size) {
     return ChangeExtras(set, [&](Extras& extras) {

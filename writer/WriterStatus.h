@@ -213,7 +213,8 @@ enum {
     kWriterFormatTrackTitles = 128, ///< Carries the titles of tracks.
     kWriterFormatTimecode = 256,    ///< Carries a timecode, which is a text about the pictures: "timecode".
     /// Carries chapters as texts about the movie: "CHAPTER001", which is when it begins, "CHAPTER001NAME" ...
-    kWriterFormatChapterTexts = 512
+    kWriterFormatChapterTexts = 512,
+    kWriterFormatCoverText = 1024 ///< Carries what the cover is: MWDescribeCover.
 };
 
 /// kWriterFormat... of the format with that code, together; 0 for one that is not in the table.
@@ -331,6 +332,11 @@ int MWAddChapter(uint32_t set, int64_t begin, int64_t end, const char* title);
 
 /// A cover, as JPEG or PNG; a second call replaces it. In MP4, MOV and M4A it comes with the close.
 int MWSetCover(uint32_t set, const void* data, int64_t size);
+
+/// The name of the cover's file, where it is an attached one (kWriterFormatAttachments), and what it is, for
+/// people (kWriterFormatCoverText). Null or an empty text: "cover.jpg" or "cover.png", and nothing. 0 without
+/// a cover.
+int MWDescribeCover(uint32_t set, const char* fileName, const char* description);
 
 /// An attached file.
 int MWAddAttachment(uint32_t set, const char* fileName, const char* mimeType, const void* data, int64_t size);

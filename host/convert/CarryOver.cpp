@@ -171,13 +171,31 @@ std::string WhySoundStays(const SourceInfo& source, const StreamInfo& stream, co
     return {};
 }
 
-bool CarryFile(const Movie& movie, const StreamInfo& stream, uint32_t set) {
+/// Hands a cover or an attachment that the format can hold to the writer; a cover after the first one is a
+/// file among others. Empty when it was taken.
+std::string CarryStored(const Movie& movie, const StreamInfo& stream, const Request& request,
+                        const FileFormatInfo& format, uint32_t set, bool& hasCover) {
+    if (stream.kind != StreamKind::kCover && stream.kind != StreamKind::kAttachment)
+        return {};
+    const bool holdsFiles = (MWGetFormatTraits(format.fccFormat) & kWriterFormatAttachments) != 0;
+    if (stream.kind == StreamKind::kCover && hasCover && !holdsFiles)
+        return "only one cover is carried";
     const std::vector<uint8_t> data = movie.StoredFile(stream.index);
     const auto size = static_cast<int64_t>(data.size());
-    if (stream.kind == StreamKind::kCover)
-        return MWSetCover(set, data.data(), size) != 0;
-    return MWAddAttachment(set, stream.fileName.c_str(), stream.mimeType.c_str(), data.data(), size) != 0 &&
-           MWDescribeAttachment(set, stream.title.c_str()) != 0;
+    const char* title = request.noMetadata ? "" : stream.title.c_str();
+    if (stream.kind == StreamKind::kCover && !hasCover) {
+        hasCover = MWSetCover(set, data.data(), size) != 0;
+        if (hasCover)
+            MWDescribeCover(set, stream.fileName.c_str(), title);
+        return hasCover ? "" : "it is neither JPEG nor PNG";
+    }
+    const bool unnamed = stream.kind == StreamKind::kCover && stream.fileName.empty();
+    const char* type = stream.codec == "png" ? "png" : "jpeg";
+    const std::string name = unnamed ? fmt::format("cover-{}.{}", stream.index, type) : stream.fileName;
+    const std::string mimeType = unnamed ? fmt::format("image/{}", type) : stream.mimeType;
+    const bool taken = MWAddAttachment(set, name.c_str(), mimeType.c_str(), data.data(), size) != 0 &&
+                       MWDescribeAttachment(set, title) != 0;
+    return taken ? "" : "it has no name or no content";
 }
 
 /// What is converted and what was chosen, of a source.
@@ -223,18 +241,6 @@ std::string WhyItStays(const SourceInfo& source, const Chosen& chosen, const Str
                                                         : fmt::format("{} cannot hold it", ShortName(format));
     }
     return {};
-}
-
-/// Hands a cover or an attachment that the format can hold to the writer. Empty when it was taken.
-std::string CarryStored(const Movie& movie, const StreamInfo& stream, uint32_t set, bool& hasCover) {
-    if (stream.kind == StreamKind::kAttachment)
-        return CarryFile(movie, stream, set) ? "" : "it has no name or no content";
-    if (stream.kind != StreamKind::kCover)
-        return {};
-    if (hasCover)
-        return "only one cover is carried";
-    hasCover = CarryFile(movie, stream, set);
-    return hasCover ? "" : "it is neither JPEG nor PNG";
 }
 
 /// What the name of a file of subtitles says of its codec.
@@ -310,6 +316,15 @@ std::vector<NotCarried> LostByFormat(const SourceInfo& source, const std::vector
     for (const int stream : beside)
         if (std::optional<NotCarried> lost = LostLabel(StreamAt(source, stream), request, format))
             left.push_back(std::move(*lost));
+    const uint32_t traits = MWGetFormatTraits(format.fccFormat);
+    for (const StreamInfo& stream : source.streams)
+        if (stream.kind == StreamKind::kCover && !stream.title.empty() && !request.noMetadata &&
+            (traits & kWriterFormatCover) != 0 && (traits & kWriterFormatCoverText) == 0)
+            left.push_back({"label",
+                            stream.index,
+                            stream.codec,
+                            {},
+                            fmt::format("{} cannot hold its title", ShortName(format))});
     return left;
 }
 
@@ -356,7 +371,7 @@ Carried CarryOver(Movie& movie, const Request& request, const FileFormatInfo& fo
             continue;
         std::string reason = WhyItStays(source, chosen, stream, format, request.copySound);
         if (reason.empty())
-            reason = CarryStored(movie, stream, writerSet, hasCover);
+            reason = CarryStored(movie, stream, request, format, writerSet, hasCover);
         if (!reason.empty())
             left.push_back(LeftOf(stream, std::move(reason)));
     }

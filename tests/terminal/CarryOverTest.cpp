@@ -63,6 +63,37 @@ TEST(CarryOver, PutsIntoTheFileWhatItsFormatHoldsAndTellsTheRest) {
     EXPECT_EQ(Call({whole, folder / "quiet.avi", "-q"}).err, "");
 }
 
+TEST(CarryOver, KeepsCoversWithTheirNamesAndTitles) {
+    const Folder folder;
+    for (const char* name : {"front.png", "back.png"})
+        Ffmpeg(Join(CountedPictures(1), Args{"-frames:v", "1", folder / name}));
+    const std::string source = folder / "covers.mkv";
+    Ffmpeg(
+        Join(Beeps(1), Args{"-attach", folder / "front.png", "-attach", folder / "back.png"},
+             Words("-metadata:s:t mimetype=image/png -metadata:s:t:0 title=Face -metadata:s:t:1 title=Rear"),
+             Args{source}));
+    const auto covers = [](const std::string& path) {
+        return test_movies::Ffprobe(path,
+                                    Words("-select_streams v -show_entries "
+                                          "stream=codec_name:stream_tags=filename,title -of compact=p=0"));
+    };
+    const Result mka = Call({source, folder / "out.mka", "-q"});
+    ASSERT_EQ(mka.code, 0) << mka.err;
+    EXPECT_EQ(covers(folder / "out.mka"), "codec_name=png|tag:filename=front.png|tag:title=Face\n"
+                                          "codec_name=png|tag:filename=back.png|tag:title=Rear\n");
+    const Result flac = Call({source, folder / "out.flac", "--progress", "none"});
+    ASSERT_EQ(flac.code, 0) << flac.err;
+    EXPECT_TRUE(Has(flac.err, "only one cover is carried")) << flac.err;
+    EXPECT_TRUE(Has(covers(folder / "out.flac"), "tag:title=Face"));
+    const Result m4a = Call({source, folder / "out.m4a", "--progress", "none"});
+    ASSERT_EQ(m4a.code, 0) << m4a.err;
+    EXPECT_TRUE(Has(m4a.err, "cannot hold its title")) << m4a.err;
+    ASSERT_EQ(Call({source, folder / "bare.mka", "--no-metadata", "-q"}).code, 0);
+    EXPECT_FALSE(Has(covers(folder / "bare.mka"), "title"));
+    ASSERT_EQ(Call({folder / "out.m4a", folder / "again.mka", "-q"}).code, 0);
+    EXPECT_EQ(covers(folder / "again.mka"), "codec_name=png|tag:filename=cover.png\n");
+}
+
 TEST(CarryOver, MovesChaptersWithTheRange) {
     const Folder folder;
     const std::string whole = MakeWhole(folder);

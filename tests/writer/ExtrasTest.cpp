@@ -39,6 +39,8 @@ struct ReadExtras {
     std::string soundLanguage;
     std::vector<ReadChapter> chapters;
     std::string cover;
+    std::string coverText;
+    std::string coverFile;
     std::map<std::string, std::string> attachments;
     unsigned streams = 0;
 };
@@ -64,9 +66,11 @@ ReadExtras ReadExtrasOf(const std::string& path) {
             while ((entry = av_dict_get(stream.metadata, "", entry, AV_DICT_IGNORE_SUFFIX)) != nullptr)
                 read.tags.emplace(entry->key, entry->value);
         }
-        if ((stream.disposition & AV_DISPOSITION_ATTACHED_PIC) != 0)
+        if ((stream.disposition & AV_DISPOSITION_ATTACHED_PIC) != 0) {
             read.cover.assign(stream.attached_pic.data, stream.attached_pic.data + stream.attached_pic.size);
-        else if (parameters.codec_type == AVMEDIA_TYPE_ATTACHMENT)
+            read.coverText = Value(stream.metadata, "title");
+            read.coverFile = Value(stream.metadata, "filename");
+        } else if (parameters.codec_type == AVMEDIA_TYPE_ATTACHMENT)
             read.attachments[Value(stream.metadata, "filename")].assign(
                 parameters.extradata, parameters.extradata + parameters.extradata_size);
     }
@@ -90,7 +94,9 @@ void Fill(uint32_t set) {
     ASSERT_EQ(MWAddChapter(set, 0, kSecond / 2, "One"), 1);
     ASSERT_EQ(MWAddChapter(set, kSecond / 2, 3 * kSecond / 2, "Zwei – ü"), 1);
     ASSERT_EQ(MWAddChapter(set, 3 * kSecond / 2, 5 * kSecond, ""), 1);
+    EXPECT_EQ(MWDescribeCover(set, "none.jpg", "there is none yet"), 0);
     ASSERT_EQ(MWSetCover(set, kJpeg.data(), static_cast<int64_t>(kJpeg.size())), 1);
+    ASSERT_EQ(MWDescribeCover(set, "front.jpg", "Die Brücke"), 1);
     ASSERT_EQ(MWAddAttachment(set, "a.ttf", "font/ttf", "glyphs", 6), 1);
 }
 
@@ -135,6 +141,8 @@ TEST_F(Extras, AreInEachFormatAsFarAsItCarriesThem) {
             EXPECT_EQ(read.chapters[2].title, "");
         }
         EXPECT_EQ(read.cover, (traits & kWriterFormatCover) != 0 ? kJpeg : "");
+        EXPECT_EQ(read.coverText, (traits & kWriterFormatCoverText) != 0 ? "Die Brücke" : "");
+        EXPECT_EQ(read.coverFile, (traits & kWriterFormatAttachments) != 0 ? "front.jpg" : "");
         EXPECT_EQ(read.attachments.count("a.ttf"), (traits & kWriterFormatAttachments) != 0 ? 1U : 0U);
     }
 }
