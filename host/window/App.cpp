@@ -5,6 +5,8 @@
 #include <QApplication>
 #include <QStyle>
 
+#include <cstdlib>
+
 namespace movieconv::window {
 
 App::App(Runner& runner, Settings& settings, const std::string& journal)
@@ -25,6 +27,7 @@ App::App(Runner& runner, Settings& settings, const std::string& journal)
     connect(&guard_, &SleepGuard::Refused, &window_, &MainWindow::Tell);
     connect(&notifier_, &Notifier::Chosen, this, &App::Raise);
     connect(&window_, &MainWindow::Closed, qApp, &QApplication::quit);
+    connect(&window_, &MainWindow::LeaveWanted, this, &App::Leave);
     connect(&window_, &MainWindow::FolderWanted, &ShowInFolder);
     connect(&window_, &MainWindow::FileWanted, &OpenFile);
     // Where a desktop brings a style, it brings the palette as well.
@@ -57,6 +60,12 @@ void App::EndSoon() {
         dispatcher_.StopAll();
     else
         QApplication::quit();
+}
+
+/// Waits for no conversion: those that run are offered again the next time, with what they have written.
+void App::Leave() {
+    journal_.Settle();
+    std::_Exit(EXIT_SUCCESS);
 }
 
 void App::OnWorkBegan() {

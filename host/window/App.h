@@ -35,6 +35,7 @@ public:
     Dispatcher& TheDispatcher() { return dispatcher_; }
 
 private:
+    void Leave();
     void OnWorkBegan();
     void OnWorkEnded(const Totals& totals);
     void Raise();

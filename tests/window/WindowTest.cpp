@@ -416,6 +416,23 @@ TEST_F(WindowTest, AsksOnceBeforeItClosesWhileWorking) {
     EXPECT_EQ(At(1).state, State::kWaiting);
 }
 
+TEST_F(WindowTest, LeavesAConversionThatDoesNotAnswer) {
+    runner.endsWhenStopped = false;
+    QObject::disconnect(&Window(), &MainWindow::LeaveWanted, app.get(), nullptr); // it would end the tests
+    const QSignalSpy left(&Window(), &MainWindow::LeaveWanted);
+    Add({"a.mkv"});
+    Act("start");
+    ASSERT_TRUE(AwaitScripts(1));
+    Act("quit");
+    Act("quit");
+    EXPECT_TRUE(Script(0).stopped);
+    EXPECT_TRUE(Tells("Waiting until all is stopped."));
+    EXPECT_TRUE(left.isEmpty());
+    Click("Close at once");
+    EXPECT_EQ(left.size(), 1);
+    Script(0).End(Ending::kStopped);
+}
+
 TEST_F(WindowTest, OffersWhatWasInterruptedOnceMore) {
     Add({"a.mkv", "b.mkv"});
     Act("start");

@@ -1851,6 +1851,14 @@
         <source>closes when done</source>
         <translation>schließt danach</translation>
     </message>
+    <message>
+        <source>Waiting until all is stopped. A disk or a network that does not answer holds this up.</source>
+        <translation>Es wird gewartet, bis alles abgebrochen ist. Ein Laufwerk oder Netz, das nicht antwortet, hält das auf.</translation>
+    </message>
+    <message>
+        <source>Close at once</source>
+        <translation>Sofort schließen</translation>
+    </message>
 </context>
 <context>
     <name>movieconv::window::MoreSettings</name>

@@ -24,6 +24,7 @@
 #include <algorithm>
 #include <cmath>
 #include <stdexcept>
+#include <utility>
 
 namespace movieconv::window {
 namespace {
@@ -371,25 +372,31 @@ void MainWindow::AskBeforeClosing() {
         ShowTotals();
     };
     notices_->Show(kClosing, tr("Movies are being converted. What is converted so far can be kept as it is."),
-                   {{tr("Stop and close"),
-                     [this, close] {
-                         close(true);
-                         dispatcher_.StopAll();
-                     }},
+                   {{tr("Stop and close"), [this] { StopAndClose(); }},
                     {tr("Close when done"), [close] { close(true); }},
                     {tr("Go on"), [close] { close(false); }}});
+}
+
+void MainWindow::StopAndClose() {
+    closing_ = true;
+    ShowTotals();
+    notices_->Show(
+        kClosing, tr("Waiting until all is stopped. A disk or a network that does not answer holds this up."),
+        {{tr("Close at once"), [this] {
+              settings_.SaveGeometry(saveGeometry());
+              Q_EMIT LeaveWanted();
+          }}});
+    if (!std::exchange(stopping_, true))
+        dispatcher_.StopAll();
 }
 
 void MainWindow::closeEvent(QCloseEvent* event) {
     if (dispatcher_.IsWorking()) {
         event->ignore();
-        if (notices_->Shows(kClosing)) { // asked already: the second wish is an answer
-            notices_->Dismiss(kClosing);
-            closing_ = true;
-            dispatcher_.StopAll();
-        } else {
+        if (stopping_ || notices_->Shows(kClosing)) // asked already: the second wish is an answer
+            StopAndClose();
+        else
             AskBeforeClosing();
-        }
         return;
     }
     settings_.SaveGeometry(saveGeometry());

@@ -38,6 +38,8 @@ public:
 Q_SIGNALS:
     /// The user wants the program to end, and nothing stands in the way.
     void Closed();
+    /// The user wants the program to end while a conversion does not answer.
+    void LeaveWanted();
     void FileWanted(const std::string& path);
     void FolderWanted(const std::string& path);
 
@@ -74,12 +76,14 @@ private:
     void OnChanged(quint64 id);
     void OnEnded(quint64 id);
     void AskBeforeClosing();
+    void StopAndClose();
 
     Queue& queue_;
     Dispatcher& dispatcher_;
     Runner& runner_;
     Settings& settings_;
     bool closing_ = false;
+    bool stopping_ = false; // in order to close
 
     QAction* start_ = nullptr;
     QAction* pause_ = nullptr;
