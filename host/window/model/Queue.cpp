@@ -148,9 +148,16 @@ void Queue::MoveBy(const QList<quint64>& ids, int by) {
 void Queue::MoveBefore(const QList<quint64>& ids, int row) {
     const Batch batch(*this);
     int before = row;
-    for (const quint64 id : ids) {
-        moveRows({}, RowOf(id), 1, {}, before);
-        before = RowOf(id) + 1;
+    for (qsizetype begin = 0, end = 0; begin < ids.size(); begin = end) {
+        const int first = RowOf(ids[begin]);
+        if (first < 0)
+            return;
+        int next = first;
+        for (; end < ids.size() && next < rowCount() && entries_[static_cast<size_t>(next)].id == ids[end];
+             ++end)
+            ++next;
+        moveRows({}, first, next - first, {}, before);
+        before = RowOf(ids[end - 1]) + 1;
     }
 }
 
@@ -370,9 +377,20 @@ void Queue::TakeFound(const Entry& seen, const Entry& found) {
 
 /// By the rules, and apart from the other entries' targets; whether there is such a file is found out later.
 void Queue::AssignTarget(Entry& entry) {
+    const Batch batch(*this);
+    if (!taken_) {
+        taken_.emplace();
+        for (const Entry& each : entries_)
+            ++(*taken_)[each.target];
+    }
+    if (const auto own = taken_->find(entry.target); own != taken_->end())
+        --own->second;
     entry.target = TargetFor(
-        entry, naming_, ExtensionFor(entry.wishes), QDate::currentDate(),
-        [&](const std::string& path) { return path == entry.source || IsTakenByOther(entry, path); });
+        entry, naming_, ExtensionFor(entry.wishes), QDate::currentDate(), [&](const std::string& path) {
+            const auto others = taken_->find(path);
+            return path == entry.source || (others != taken_->end() && others->second > 0);
+        });
+    ++(*taken_)[entry.target];
 }
 
 bool Queue::IsTakenByOther(const Entry& entry, const std::string& path) const {
@@ -393,6 +411,7 @@ void Queue::TellRearranged() {
 Queue::Batch::~Batch() {
     if (--queue_.batches_ > 0)
         return;
+    queue_.taken_.reset();
     if (std::exchange(queue_.keepAfter_, false))
         queue_.journal_.Keep(queue_.entries_);
     if (const QList<quint64> ids = std::exchange(queue_.examineAfter_, {}); !ids.isEmpty()) {

@@ -11,7 +11,10 @@
 
 #include <functional>
 #include <memory>
+#include <optional>
 #include <set>
+#include <string>
+#include <unordered_map>
 #include <vector>
 
 namespace movieconv::window {
@@ -130,6 +133,8 @@ private:
     Wishes defaults_;
     int searches_ = 0;
     int batches_ = 0;
+    /// How many entries have each target, while a batch gives out new ones.
+    std::optional<std::unordered_map<std::string, int>> taken_;
     bool keepAfter_ = false; // these three: when the batch ends
     bool tellAfter_ = false;
     QList<quint64> examineAfter_;
