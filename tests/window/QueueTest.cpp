@@ -77,6 +77,29 @@ TEST(Queue, MovesAndRemoves) {
     EXPECT_EQ(bench.Names(), (Names{"4", "3"}));
 }
 
+TEST(Queue, MovesManyAtOnce) {
+    const struct {
+        std::vector<int> rows;
+        int before;
+        Names result;
+    } cases[] = {{{3, 4}, 0, {"4", "5", "1", "2", "3"}},
+                 {{0, 2, 3}, 5, {"2", "5", "1", "3", "4"}},
+                 {{4, 0}, 2, {"2", "5", "1", "3", "4"}},
+                 {{1, 2, 3}, 2, {"1", "2", "3", "4", "5"}},
+                 {{1, 9, 3}, 0, {"2", "1", "3", "4", "5"}}};
+    for (const auto& [rows, before, result] : cases) {
+        Bench bench;
+        const QAbstractItemModelTester tester(&bench.queue,
+                                              QAbstractItemModelTester::FailureReportingMode::Fatal);
+        bench.Add({"1", "2", "3", "4", "5"});
+        QList<quint64> ids;
+        for (const int row : rows)
+            ids.append(row < 5 ? bench.Id(row) : 99);
+        bench.queue.MoveBefore(ids, before);
+        EXPECT_EQ(bench.Names(), result);
+    }
+}
+
 TEST(Queue, SurvivesTheProgram) {
     Bench bench;
     bench.Add({"1", "2", "3"});
