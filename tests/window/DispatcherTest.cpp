@@ -171,12 +171,14 @@ TEST_F(DispatcherTest, ShowsThePicturesOfOne) {
     dispatcher.ShowPicturesOf(Id(0));
     EXPECT_TRUE(Script(0).shown);
     EXPECT_FALSE(Script(1).shown);
-    const QImage picture = runner.PictureAt({}, 0, 16);
+    const QImage picture = runner.PictureAt({}, 0, 160);
+    dispatcher.SetPictureRoom({32, 100});
     for (int i = 0; i < 100; ++i)
         Script(0).listener->OnPicture(picture);
     ASSERT_TRUE(Await([&] { return !pictures.isEmpty(); }));
     EXPECT_EQ(pictures.size(), 1); // of a backlog only the newest
     EXPECT_EQ(pictures[0][0].value<quint64>(), Id(0));
+    EXPECT_EQ(pictures[0][1].value<QImage>().size(), QSize(32, 18)); // as large as there is room
 }
 
 TEST_F(DispatcherTest, KeepsNotesAndTellsOfAFullDisk) {

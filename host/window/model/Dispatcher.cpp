@@ -4,6 +4,7 @@
 #include <QTime>
 
 #include <algorithm>
+#include <atomic>
 #include <mutex>
 #include <utility>
 
@@ -20,7 +21,8 @@ public:
         std::optional<Outcome> outcome;
     };
 
-    Mailbox(Dispatcher& dispatcher, quint64 id) : dispatcher_(&dispatcher), id_(id) {}
+    Mailbox(Dispatcher& dispatcher, quint64 id)
+        : dispatcher_(&dispatcher), id_(id), pictureRoom_(dispatcher.pictureRoom_) {}
 
     /// Nobody collects any more: a run may have news for longer than there is a dispatcher.
     void Close() {
@@ -31,8 +33,14 @@ public:
     void OnFigures(const Figures& figures) override {
         Put([&](News& news) { news.figures = figures; });
     }
+    /// Brought to its size on the run's thread: when the window paints a picture in another size, it waits
+    /// for threads that wait for a processor.
     void OnPicture(const QImage& picture) override {
-        Put([&](News& news) { news.picture = picture; });
+        const QSize room = *pictureRoom_;
+        const QImage fitted = picture.isNull() || room.isEmpty()
+                                  ? picture
+                                  : picture.scaled(room, Qt::KeepAspectRatio, Qt::SmoothTransformation);
+        Put([&](News& news) { news.picture = fitted; });
     }
     void OnNote(const QString& sentence) override {
         Put([&](News& news) { news.notes += sentence; });
@@ -62,7 +70,8 @@ private:
 
     Dispatcher* dispatcher_;
     const quint64 id_;
-    std::mutex mutex_; // of all but the number
+    const std::shared_ptr<const std::atomic<QSize>> pictureRoom_;
+    std::mutex mutex_; // of what follows, and of the dispatcher
     News news_;
     bool posted_ = false;
 };
@@ -198,6 +207,10 @@ void Dispatcher::ShowPicturesOf(quint64 id) {
         if (const auto found = active_.find(one); found != active_.end())
             found->second.run->ShowPictures(one == id);
     shown_ = id;
+}
+
+void Dispatcher::SetPictureRoom(QSize pixels) {
+    *pictureRoom_ = pixels;
 }
 
 /// Starts what there is room for, unless all that runs is paused; ends the work when nothing is left.

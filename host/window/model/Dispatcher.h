@@ -6,7 +6,9 @@
 
 #include <QImage>
 #include <QObject>
+#include <QSize>
 
+#include <atomic>
 #include <map>
 #include <memory>
 
@@ -61,6 +63,8 @@ public:
 
     /// Whose pictures PictureCame shows; 0 for nobody's.
     void ShowPicturesOf(quint64 id);
+    /// Pictures come as large as they fit in there, in their own shape; an empty size: as they are.
+    void SetPictureRoom(QSize pixels);
 
 Q_SIGNALS:
     void WorkBegan();
@@ -93,6 +97,7 @@ private:
     bool working_ = false;
     bool stopAfterThis_ = false;
     quint64 shown_ = 0;
+    const std::shared_ptr<std::atomic<QSize>> pictureRoom_ = std::make_shared<std::atomic<QSize>>();
     int done_ = 0;
     int failed_ = 0;
     double secondsDone_ = 0;

@@ -104,6 +104,7 @@ void MainWindow::Connect() {
             close();
     });
     connect(&dispatcher_, &Dispatcher::PictureCame, workPage_, &WorkPage::ShowPicture);
+    connect(workPage_, &WorkPage::PictureRoomChanged, &dispatcher_, &Dispatcher::SetPictureRoom);
     connect(workPage_, &WorkPage::PauseWanted, this, [this](quint64 id, bool pause) {
         if (pause)
             dispatcher_.Pause(id);

@@ -32,6 +32,7 @@ PictureView::PictureView(QWidget* parent) : QWidget(parent) {
 
 void PictureView::Show(const QImage& picture) {
     picture_ = picture;
+    picture_.setDevicePixelRatio(devicePixelRatioF());
     update();
 }
 
@@ -46,10 +47,19 @@ void PictureView::paintEvent(QPaintEvent*) {
                   QColor(0x5a, 0x60, 0x68));
         return;
     }
-    const QSizeF size = QSizeF(picture_.size()).scaled(QSizeF(this->size()), Qt::KeepAspectRatio);
-    const QRectF place(QPointF((width() - size.width()) / 2, (height() - size.height()) / 2), size);
     painter.setClipPath(outline);
-    painter.drawImage(place, picture_);
+    const QSizeF size = picture_.deviceIndependentSize().scaled(QSizeF(this->size()), Qt::KeepAspectRatio);
+    const QPointF corner((width() - size.width()) / 2, (height() - size.height()) / 2);
+    // It has been made to fit, unless the room has changed since.
+    if (picture_.deviceIndependentSize().toSize() == size.toSize())
+        painter.drawImage(corner.toPoint(), picture_);
+    else
+        painter.drawImage(QRectF(corner, size), picture_);
+}
+
+void PictureView::resizeEvent(QResizeEvent* event) {
+    QWidget::resizeEvent(event);
+    Q_EMIT RoomChanged((QSizeF(size()) * devicePixelRatioF()).toSize());
 }
 
 WorkPage::WorkPage(QWidget* parent)
@@ -62,6 +72,7 @@ WorkPage::WorkPage(QWidget* parent)
       pause_(new QPushButton),
       stop_(new QPushButton(IconOf(Sign::kStop), tr("S&top"))),
       log_(new LogPanel) {
+    connect(picture_, &PictureView::RoomChanged, this, &WorkPage::PictureRoomChanged);
     bar_->setAccessibleName(tr("Progress of the movie"));
     pause_->setObjectName(QStringLiteral("pauseThis"));
     stop_->setObjectName(QStringLiteral("stopThis"));

@@ -28,8 +28,12 @@ public:
     void Show(const QImage& picture);
     const QImage& Picture() const { return picture_; }
 
+Q_SIGNALS:
+    void RoomChanged(QSize pixels);
+
 protected:
     void paintEvent(QPaintEvent* event) override;
+    void resizeEvent(QResizeEvent* event) override;
 
 private:
     QImage picture_;
@@ -46,6 +50,8 @@ public:
 Q_SIGNALS:
     void PauseWanted(quint64 id, bool pause);
     void StopWanted(quint64 id);
+    /// There is room for a picture of so many pixels.
+    void PictureRoomChanged(QSize pixels);
 
 protected:
     void resizeEvent(QResizeEvent* event) override;
