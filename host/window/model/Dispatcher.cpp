@@ -26,7 +26,7 @@ public:
 
     /// Nobody collects any more: a run may have news for longer than there is a dispatcher.
     void Close() {
-        const std::lock_guard lock(mutex_);
+        const std::lock_guard lock(posting_);
         dispatcher_ = nullptr;
     }
 
@@ -58,20 +58,22 @@ public:
 private:
     template <class Change>
     void Put(Change change) {
-        const std::lock_guard lock(mutex_);
-        if (dispatcher_ == nullptr)
-            return;
-        change(news_);
-        if (posted_)
-            return;
-        posted_ = true;
-        dispatcher_->inbox_.Put([dispatcher = dispatcher_, id = id_] { dispatcher->Collect(id); });
+        {
+            const std::lock_guard lock(mutex_);
+            change(news_);
+            if (std::exchange(posted_, true))
+                return;
+        }
+        const std::lock_guard lock(posting_); // which the window's thread takes at the end only
+        if (dispatcher_ != nullptr)
+            dispatcher_->inbox_.Put([dispatcher = dispatcher_, id = id_] { dispatcher->Collect(id); });
     }
 
-    Dispatcher* dispatcher_;
+    std::mutex posting_;
+    Dispatcher* dispatcher_; // as long as that is not null, it stays while `posting_` is held
     const quint64 id_;
     const std::shared_ptr<const std::atomic<QSize>> pictureRoom_;
-    std::mutex mutex_; // of what follows, and of the dispatcher
+    std::mutex mutex_; // of what follows
     News news_;
     bool posted_ = false;
 };

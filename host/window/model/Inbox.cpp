@@ -8,8 +8,11 @@
 namespace movieconv::window {
 
 void Inbox::Put(Task task) {
-    const std::lock_guard lock(mutex_);
-    tasks_.push_back(std::move(task));
+    {
+        const std::lock_guard lock(mutex_);
+        tasks_.push_back(std::move(task));
+    }
+    // It wakes the window's thread, which must not find the lock taken.
     QCoreApplication::postEvent(this, new QEvent(QEvent::User));
 }
 
