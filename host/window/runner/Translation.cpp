@@ -11,7 +11,7 @@
 namespace movieconv::window {
 namespace {
 
-constexpr int kNiceness = 19; // lest the window waits for a processor
+constexpr int kNiceness = 10; // lest the window waits for a processor
 constexpr int kWidest = 32768;
 constexpr int kMiddle = 50; // of the window's scale of quality
 
