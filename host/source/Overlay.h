@@ -4,6 +4,7 @@
 
 #include "ffmpeg/AvHandles.h"
 
+#include <array>
 #include <cstdint>
 #include <vector>
 
@@ -56,7 +57,7 @@ private:
     int width_ = 0; // even
     int height_ = 0;
     bool deep_ = false;
-    Plane planes_[3];
+    std::array<Plane, 3> planes_;
 };
 
 } // namespace movieconv

@@ -6,13 +6,14 @@
 
 #include <string>
 
-/// Four seconds of pictures in motion, with sound.
-inline std::string Holiday() {
+/// Pictures in motion, at most ten seconds of them, with sound.
+inline std::string Holiday(int seconds = 4) {
     const std::string pictures =
         "mandelbrot=s=1280x720:r=25:start_scale=0.6:end_scale=0.01:end_pts=250,format=yuv420p";
-    return test_movies::Make("window-4s.mkv",
+    return test_movies::Make("window-" + std::to_string(seconds) + "s.mkv",
                              {"-f", "lavfi", "-i", pictures, "-f", "lavfi", "-i", "sine=440:r=48000", "-t",
-                              "4", "-c:v", "libx264", "-preset", "veryfast", "-c:a", "aac"});
+                              std::to_string(seconds), "-c:v", "libx264", "-preset", "veryfast", "-c:a",
+                              "aac"});
 }
 
 #endif
