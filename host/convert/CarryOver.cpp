@@ -324,7 +324,7 @@ std::vector<NotCarried> LostByFormat(const SourceInfo& source, const std::vector
                             stream.index,
                             stream.codec,
                             {},
-                            fmt::format("{} cannot hold its title", ShortName(format))});
+                            fmt::format("{} cannot hold its {}", ShortName(format), "title")});
     return left;
 }
 
