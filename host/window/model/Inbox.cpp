@@ -8,11 +8,12 @@
 namespace movieconv::window {
 
 void Inbox::Put(Task task) {
+    const std::lock_guard turn(posting_);
     {
         const std::lock_guard lock(mutex_);
         tasks_.push_back(std::move(task));
     }
-    // It wakes the window's thread, which must not find the lock taken.
+    // It wakes the window's thread, which must not find the tasks locked.
     QCoreApplication::postEvent(this, new QEvent(QEvent::User));
 }
 
