@@ -120,8 +120,7 @@ std::vector<uint8_t> ReadStart(ByteFile& file, const PlacedPacket& packet) {
 }
 
 bool IsText(const PacketWriter& written, int stream) {
-    return stream >= 0 && stream < written.StreamCount() &&
-           written.Stream(stream).description.parameters->codec_id == AV_CODEC_ID_MOV_TEXT;
+    return written.Stream(stream).description.parameters->codec_id == AV_CODEC_ID_MOV_TEXT;
 }
 
 /// Calls `take` with all packets. In fragments a picture lasts until the next one is decoded, which may be

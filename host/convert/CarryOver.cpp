@@ -190,7 +190,7 @@ std::string CarryStored(const Movie& movie, const StreamInfo& stream, const Requ
         return hasCover ? "" : "it is neither JPEG nor PNG";
     }
     const bool unnamed = stream.kind == StreamKind::kCover && stream.fileName.empty();
-    const char* type = stream.codec == "png" ? "png" : "jpeg";
+    const std::string type = stream.codec == "mjpeg" ? "jpeg" : stream.codec;
     const std::string name = unnamed ? fmt::format("cover-{}.{}", stream.index, type) : stream.fileName;
     const std::string mimeType = unnamed ? fmt::format("image/{}", type) : stream.mimeType;
     const bool taken = MWAddAttachment(set, name.c_str(), mimeType.c_str(), data.data(), size) != 0 &&
@@ -303,6 +303,23 @@ void AddUnreadChapters(const SourceInfo& source, const Request& request, std::ve
     add(source.furtherTitles, "have titles in further languages");
 }
 
+/// Of the one cover that is carried.
+std::optional<NotCarried> LostCoverTitle(const SourceInfo& source, const Request& request,
+                                         const FileFormatInfo& format) {
+    const uint32_t traits = MWGetFormatTraits(format.fccFormat);
+    const auto cover =
+        std::find_if(source.streams.begin(), source.streams.end(),
+                     [](const StreamInfo& stream) { return stream.kind == StreamKind::kCover; });
+    if (cover == source.streams.end() || cover->title.empty() || request.noMetadata ||
+        (traits & kWriterFormatCover) == 0 || (traits & kWriterFormatCoverText) != 0)
+        return std::nullopt;
+    return NotCarried{"label",
+                      cover->index,
+                      cover->codec,
+                      {},
+                      fmt::format("{} cannot hold its {}", ShortName(format), "title")};
+}
+
 /// Texts, labels and chapters that the format has no room for.
 std::vector<NotCarried> LostByFormat(const SourceInfo& source, const std::vector<int>& beside,
                                      const Request& request, const FileFormatInfo& format) {
@@ -316,15 +333,8 @@ std::vector<NotCarried> LostByFormat(const SourceInfo& source, const std::vector
     for (const int stream : beside)
         if (std::optional<NotCarried> lost = LostLabel(StreamAt(source, stream), request, format))
             left.push_back(std::move(*lost));
-    const uint32_t traits = MWGetFormatTraits(format.fccFormat);
-    for (const StreamInfo& stream : source.streams)
-        if (stream.kind == StreamKind::kCover && !stream.title.empty() && !request.noMetadata &&
-            (traits & kWriterFormatCover) != 0 && (traits & kWriterFormatCoverText) == 0)
-            left.push_back({"label",
-                            stream.index,
-                            stream.codec,
-                            {},
-                            fmt::format("{} cannot hold its {}", ShortName(format), "title")});
+    if (std::optional<NotCarried> title = LostCoverTitle(source, request, format))
+        left.push_back(*std::move(title));
     return left;
 }
 

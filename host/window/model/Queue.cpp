@@ -340,8 +340,8 @@ void Queue::ExamineAmong(const std::shared_ptr<const Targets>& targets, quint64 
                 found.facts = runner_.Look(found.source);
             if (!found.targetNamed && found.state == State::kWaiting) {
                 found.target = TargetFor(found, naming, extension, today, [&](const std::string& path) {
-                    const size_t own = path == seen.target ? 1 : 0;
-                    return targets->count(path) > own || Exists(path);
+                    const int own = path == seen.target ? 1 : 0;
+                    return CountOf(*targets, path) > own || Exists(path);
                 });
             }
             found.findings =
@@ -378,19 +378,26 @@ void Queue::TakeFound(const Entry& seen, const Entry& found) {
 /// By the rules, and apart from the other entries' targets; whether there is such a file is found out later.
 void Queue::AssignTarget(Entry& entry) {
     const Batch batch(*this);
-    if (!taken_) {
-        taken_.emplace();
-        for (const Entry& each : entries_)
-            ++(*taken_)[each.target];
-    }
+    if (!taken_)
+        taken_ = CountTargets();
     if (const auto own = taken_->find(entry.target); own != taken_->end())
         --own->second;
     entry.target = TargetFor(
-        entry, naming_, ExtensionFor(entry.wishes), QDate::currentDate(), [&](const std::string& path) {
-            const auto others = taken_->find(path);
-            return path == entry.source || (others != taken_->end() && others->second > 0);
-        });
+        entry, naming_, ExtensionFor(entry.wishes), QDate::currentDate(),
+        [&](const std::string& path) { return path == entry.source || CountOf(*taken_, path) > 0; });
     ++(*taken_)[entry.target];
+}
+
+Queue::Targets Queue::CountTargets() const {
+    Targets targets;
+    for (const Entry& entry : entries_)
+        ++targets[entry.target];
+    return targets;
+}
+
+int Queue::CountOf(const Targets& targets, const std::string& path) {
+    const auto found = targets.find(path);
+    return found == targets.end() ? 0 : found->second;
 }
 
 bool Queue::IsTakenByOther(const Entry& entry, const std::string& path) const {
@@ -415,9 +422,7 @@ Queue::Batch::~Batch() {
     if (std::exchange(queue_.keepAfter_, false))
         queue_.journal_.Keep(queue_.entries_);
     if (const QList<quint64> ids = std::exchange(queue_.examineAfter_, {}); !ids.isEmpty()) {
-        auto targets = std::make_shared<Targets>();
-        for (const Entry& entry : queue_.entries_)
-            targets->insert(entry.target);
+        const auto targets = std::make_shared<const Targets>(queue_.CountTargets());
         for (const quint64 id : ids)
             queue_.ExamineAmong(targets, id);
     }

@@ -12,7 +12,6 @@
 #include <functional>
 #include <memory>
 #include <optional>
-#include <set>
 #include <string>
 #include <unordered_map>
 #include <vector>
@@ -96,7 +95,7 @@ Q_SIGNALS:
     void Complaint(const QString& sentence);
 
 private:
-    using Targets = std::multiset<std::string>;
+    using Targets = std::unordered_map<std::string, int>; ///< How many entries have each.
 
     /// Makes many changes one: when it ends, the journal is written once, Rearranged is told once, and all
     /// that have to be are examined.
@@ -117,6 +116,8 @@ private:
     void ExamineAmong(const std::shared_ptr<const Targets>& targets, quint64 id);
     void TakeFound(const Entry& seen, const Entry& found);
     void AssignTarget(Entry& entry);
+    Targets CountTargets() const;
+    static int CountOf(const Targets& targets, const std::string& path);
     void Keep();
     void TellRearranged();
     const PresetFacts* FindPreset(const QString& name) const;
@@ -133,8 +134,8 @@ private:
     Wishes defaults_;
     int searches_ = 0;
     int batches_ = 0;
-    /// How many entries have each target, while a batch gives out new ones.
-    std::optional<std::unordered_map<std::string, int>> taken_;
+    /// While a batch gives out new ones.
+    std::optional<Targets> taken_;
     bool keepAfter_ = false; // these three: when the batch ends
     bool tellAfter_ = false;
     QList<quint64> examineAfter_;
