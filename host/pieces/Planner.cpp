@@ -45,6 +45,8 @@ std::string Obstacle(const Request& request, const Division& division) {
         return "clips are not made of pieces: leave one of both out";
     if (request.noVideo || request.preferences.noVideo || ChooseFormat(request).bHasVideo == 0)
         return "pieces are made of pictures: sound alone is converted undivided";
+    if (ChooseFormat(request).fccFormat == FourCC("GIF "))
+        return "the pictures of a GIF need the head before the first: it is converted undivided";
     if (request.playlists)
         return "a playlist cannot be converted in pieces: the plan would not notice when its parts change";
     if (division.pieces && (*division.pieces < 1 || *division.pieces > kMostPieces))

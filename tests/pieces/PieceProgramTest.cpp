@@ -166,6 +166,7 @@ TEST(Pieces, ArePlannedOfNothingThatCannotBeReadTwice) {
         "bare.h264", test_movies::Join(test_movies::CountedPictures(2), Args{"-c:v", "libx264", "-bf", "2"}));
     refuses({bare, folder / "out.mp4"}, kCannotRead, "only be converted undivided");
     refuses({Source(), folder / "out.m4a"}, kUsage, "sound alone");
+    refuses({Source(), folder / "out.gif"}, kUsage, "a GIF");
     refuses({"--split", "2", Source(), folder / "out.mp4"}, kUsage, "clips");
     refuses({"--pieces", "1000000", Source(), folder / "out.mp4"}, kUsage, "--pieces");
     refuses({"--pieces", "2", "--piece-length", "3", Source(), folder / "out.mp4"}, kUsage, "exclude");

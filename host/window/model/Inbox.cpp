@@ -3,32 +3,40 @@
 #include <QCoreApplication>
 #include <QEvent>
 
+#include <memory>
 #include <utility>
 
 namespace movieconv::window {
 
+/// The event is made, and read, under our lock: the thread sanitizer does not see the toolkit's.
 void Inbox::Put(Task task) {
     const std::lock_guard turn(posting_);
+    std::unique_ptr<QEvent> arrived;
     {
         const std::lock_guard lock(mutex_);
+        arrived = std::make_unique<QEvent>(QEvent::User);
         tasks_.push_back(std::move(task));
     }
     // It wakes the window's thread, which must not find the tasks locked.
-    QCoreApplication::postEvent(this, new QEvent(QEvent::User));
+    QCoreApplication::postEvent(this, arrived.release());
 }
 
-/// There is an event for each task.
 bool Inbox::event(QEvent* event) {
-    if (event->type() != QEvent::User)
+    Task task = TakeFor(*event);
+    if (!task)
         return QObject::event(event);
-    Task task;
-    {
-        const std::lock_guard lock(mutex_);
-        task = std::move(tasks_.front());
-        tasks_.pop_front();
-    }
     task();
     return true;
+}
+
+/// There is an event for each task; for events of other kinds there is none.
+Inbox::Task Inbox::TakeFor(const QEvent& event) {
+    const std::lock_guard lock(mutex_);
+    if (event.type() != QEvent::User)
+        return nullptr;
+    Task task = std::move(tasks_.front());
+    tasks_.pop_front();
+    return task;
 }
 
 } // namespace movieconv::window

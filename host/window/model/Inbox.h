@@ -24,6 +24,8 @@ public:
     bool event(QEvent* event) override;
 
 private:
+    Task TakeFor(const QEvent& event);
+
     std::mutex posting_; ///< Those who put take turns; the window's thread does without it.
     std::mutex mutex_;   ///< Of the tasks.
     std::deque<Task> tasks_;
