@@ -34,6 +34,8 @@ target_compile_options(movieconv_options INTERFACE
 target_link_options(movieconv_options INTERFACE -Wl,--as-needed)
 if(NOT CMAKE_CXX_FLAGS MATCHES "-fsanitize")
   target_link_options(movieconv_options INTERFACE -Wl,--no-undefined)
+else()
+  target_compile_definitions(movieconv_options INTERFACE MOVIECONV_SANITIZED)
 endif()
 
 # FFmpeg's development files may be installed for another architecture than the one being built.

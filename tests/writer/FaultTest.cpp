@@ -130,7 +130,7 @@ struct Disk {
 
 /// From one failing write to the next that is tried. Under a sanitizer a few of all are enough.
 int WriteStep([[maybe_unused]] int writes) {
-#if defined(__SANITIZE_ADDRESS__) || defined(__SANITIZE_THREAD__)
+#ifdef MOVIECONV_SANITIZED
     return 1 + writes / 16;
 #else
     return 1;

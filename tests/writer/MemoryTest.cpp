@@ -21,7 +21,7 @@
 
 #include <unistd.h>
 
-#ifdef __SANITIZE_ADDRESS__
+#ifdef MOVIECONV_SANITIZED
 // The libraries keep no frame pointers: a stack that is walked by them ends at once, or goes astray. Only
 // with whole stacks are the libraries' leaks told from ours, by tests/lsan.supp.
 extern "C" __attribute__((visibility("default"))) const char* __asan_default_options() {
@@ -45,7 +45,7 @@ using Case = std::tuple<File, Phase, Lack>;
 /// The allocation that is tried after `number`: the next one at first and in the long form, then ever later
 /// ones.
 int64_t After(int64_t number) {
-#if defined(__SANITIZE_ADDRESS__) || defined(__SANITIZE_THREAD__)
+#ifdef MOVIECONV_SANITIZED
     constexpr int64_t kDensity = 2;
 #else
     constexpr int64_t kDensity = 32;
