@@ -7,6 +7,7 @@
 #include "host/convert/Sources.h"
 #include "host/pieces/Plan.h"
 #include "host/source/MediaTime.h"
+#include "media/FourCC.h"
 #include "media/MediaWriter.h"
 #include "writer/WriterStatus.h"
 
