@@ -7,12 +7,13 @@
 
 #include <atomic>
 #include <memory>
+#include <mutex>
 #include <utility>
 
 namespace movieconv {
 
-/// Hears news on one thread and hands it on by a Loop. What still waits in the loop when this object is
-/// destroyed, on the observer's thread, is dropped.
+/// Hears news on any thread and hands it on by a Loop; without one itself, one news at a time. What still
+/// waits in the loop when this object is destroyed, on the observer's thread, is dropped.
 class Outlet final : public Observer {
 public:
     Outlet(Observer& observer, Loop loop)
@@ -51,14 +52,17 @@ private:
             if (Observer* present = *observer)
                 tell(*present);
         };
-        if (loop_)
+        if (loop_) {
             loop_(run);
-        else
+        } else {
+            const std::lock_guard lock(turn_);
             run();
+        }
     }
 
     const std::shared_ptr<std::atomic<Observer*>> observer_;
     const Loop loop_;
+    std::mutex turn_; // where there is no loop to put the news in order
 };
 
 } // namespace movieconv

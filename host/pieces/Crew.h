@@ -48,7 +48,8 @@ public:
     void Wait();
 
 protected:
-    /// `observer` hears of everything together as of one conversion, by means of `loop`.
+    /// `observer` hears of everything together as of one conversion, by means of `loop`; without one on
+    /// whichever thread has news, never on two at once.
     Crew(Observer& observer, Loop loop);
 
     struct Assignment {

@@ -9,6 +9,8 @@
 #include <mutex>
 #include <optional>
 #include <string>
+#include <thread>
+#include <vector>
 
 namespace {
 
@@ -41,6 +43,33 @@ private:
     void Report() override { Tell(UnderWay()); }
 
     std::atomic<int> left_;
+};
+
+/// Several of its threads have news at once.
+class Talkative final : public Crew {
+public:
+    explicit Talkative(movieconv::Observer& observer) : Crew(observer, {}) {}
+    ~Talkative() override { Finish(); }
+
+private:
+    Verdict Perform() override {
+        std::vector<std::thread> threads;
+        for (int i = 0; i < 4; ++i)
+            threads.emplace_back([this] {
+                for (int told = 0; told < 1000; ++told)
+                    News().Warned({});
+            });
+        for (std::thread& thread : threads)
+            thread.join();
+        Verdict verdict;
+        verdict.outcome = Outcome::kDone;
+        return verdict;
+    }
+    Mood HowToGoOn() const override { return Mood::kBreaksOff; }
+    bool HasMore() const override { return false; }
+    std::optional<Assignment> Next() override { return std::nullopt; }
+    void Take(const std::string&, const Verdict&) override {}
+    void Report() override {}
 };
 
 /// Lets a test wait until a crew has told its pause.
@@ -86,6 +115,17 @@ TEST(ACrew, EndsWhenItIsStoppedDuringAPause) {
     crew.Wait();
     EXPECT_EQ(crew.Left(), 3);
     EXPECT_EQ(crew.Result()->outcome, Outcome::kStopped);
+}
+
+TEST(ACrew, TellsAnObserverWithoutALoopOneNewsAtATime) {
+    Listener listener;
+    {
+        Talkative crew(listener);
+        crew.Start();
+        crew.Wait();
+    }
+    EXPECT_EQ(listener.warnings.size(), 4000U);
+    EXPECT_EQ(listener.ends, 1);
 }
 
 } // namespace
