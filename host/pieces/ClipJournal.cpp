@@ -158,6 +158,10 @@ void ClipJournal::NoteFinished(const std::string& clip, ClipStart next, const st
 
 void ClipJournal::Remove() const {
     unlink(path_.c_str());
+    std::error_code ignored;
+    for (const std::filesystem::path& left : FilesInTheMaking(path_))
+        if (!std::filesystem::equivalent(left, request_.input, ignored))
+            std::filesystem::remove(left, ignored);
 }
 
 } // namespace movieconv

@@ -44,6 +44,7 @@ public:
     /// The clip before `next` is finished, in that file; `opened` is BirthOf the next one. Lastingly.
     void NoteFinished(const std::string& clip, ClipStart next, const std::string& opened);
 
+    /// With what a kill left in the making.
     void Remove() const;
 
 private:

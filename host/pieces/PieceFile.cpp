@@ -44,9 +44,9 @@ int64_t SizeOf(const Descriptor& file) {
                : -1;
 }
 
-/// The files that belong to a plan of that name.
+/// The files that belong to a plan of that name, but for itself.
 std::vector<std::filesystem::path> FilesOf(const std::string& planPath) {
-    std::vector<std::filesystem::path> found;
+    std::vector<std::filesystem::path> found = FilesInTheMaking(planPath);
     const std::string prefix = std::filesystem::path(planPath).filename().string() + ".";
     std::error_code error;
     for (const auto& entry : std::filesystem::directory_iterator(text::FolderOf(planPath), error)) {

@@ -17,6 +17,8 @@
 namespace movieconv {
 namespace {
 
+constexpr std::string_view kMaking = ".making-";
+
 Failure CannotWrite(const std::string& path) {
     const bool full = errno == ENOSPC || errno == EDQUOT;
     return {full ? Category::kNoSpace : Category::kOutput,
@@ -85,11 +87,21 @@ bool RenameLastingly(const std::string& from, const std::string& to) {
 std::string NameInTheMaking(const std::string& path) {
     std::array<char, 65> host{};
     gethostname(host.data(), host.size() - 1);
-    return fmt::format("{}{}-{}", MakingPrefix(path), host.data(), getpid());
+    return fmt::format("{}{}{}-{}", path, kMaking, host.data(), getpid());
 }
 
-std::string MakingPrefix(const std::string& path) {
-    return path + ".making-";
+std::vector<std::filesystem::path> FilesInTheMaking(const std::string& path) {
+    std::vector<std::filesystem::path> found;
+    const std::string prefix = text::NameOf(path) + std::string(kMaking);
+    std::error_code error;
+    for (const auto& entry : std::filesystem::directory_iterator(text::FolderOf(path), error)) {
+        const std::string name = entry.path().filename().string();
+        const std::size_t number = name.find_last_not_of("0123456789") + 1;
+        if (name.compare(0, prefix.size(), prefix) == 0 && number > prefix.size() && number < name.size() &&
+            name[number - 1] == '-')
+            found.push_back(entry.path());
+    }
+    return found;
 }
 
 } // namespace movieconv

@@ -3,8 +3,10 @@
 #define MOVIECONV_HOST_PIECES_WHOLEFILE_H
 
 #include <cstdint>
+#include <filesystem>
 #include <string>
 #include <string_view>
+#include <vector>
 
 namespace movieconv {
 
@@ -24,8 +26,8 @@ bool RenameLastingly(const std::string& from, const std::string& to);
 /// A name beside `path` that no other process on any machine takes for the same purpose.
 std::string NameInTheMaking(const std::string& path);
 
-/// The start of such names.
-std::string MakingPrefix(const std::string& path);
+/// The files of such names: being made, or left by processes that were killed.
+std::vector<std::filesystem::path> FilesInTheMaking(const std::string& path);
 
 } // namespace movieconv
 
