@@ -39,6 +39,16 @@ bool SameRate(double one, double other) {
     return std::abs(one - other) <= 0.001 * other;
 }
 
+/// The rate itself where the codec takes any; else the nearest of its own that is not below, or the highest.
+AVRational TakenRate(const PictureCodec& codec, double rate) {
+    const AVRational* own = codec.rates;
+    if (own == nullptr)
+        return av::ExactRate(rate);
+    while (own[1].num != 0 && !SameRate(rate, av_q2d(*own)) && av_q2d(*own) < rate)
+        ++own;
+    return *own;
+}
+
 int ChooseThreads(const PictureCodec& codec, const WriterOptions& options) {
     if (options.nEncoderThreads > 0)
         return options.nEncoderThreads;
@@ -98,8 +108,9 @@ PictureSettings MakePictureSettings(const EncodeParam& param, const VideoFormat&
         throw WriterFailure(kWriterErrorArgument, "Pictures of " + std::to_string(settings.width) + "x" +
                                                       std::to_string(settings.height) +
                                                       " cannot be written; choose another size.");
-    settings.rate = av::ExactRate(
-        FirstPositive(UsableRate(param.dFrameRate), UsableRate(source.dFrameRate), kDefaultFrameRate));
+    const double rate =
+        FirstPositive(UsableRate(param.dFrameRate), UsableRate(source.dFrameRate), kDefaultFrameRate);
+    settings.rate = options.bSteadyRate != 0 ? av::ExactRate(rate) : TakenRate(codec, rate);
     settings.bitrate = FirstPositive(param.nVideoBitrate, kUsualVideoBitrate, 0);
     settings.maxBitrate = param.nVideoRateMode != 0 ? std::max(0, param.nVideoMaxBitrate) : 0;
     settings.threads = ChooseThreads(codec, options);
@@ -157,7 +168,8 @@ PicturePlan MakePicturePlan(const EncodeParam& param, const VideoFormat& source,
     plan.clock = MakePictureClock(plan.settings.rate, container.kind == ContainerKind::kSteadyRate);
     const double sourceRate = UsableRate(source.dFrameRate);
     const double rate = av_q2d(plan.settings.rate);
-    plan.keepStamps = sourceRate > 0.0 && SameRate(rate, sourceRate);
+    plan.keepStamps = sourceRate > 0.0 && SameRate(rate, sourceRate) && options.bSteadyRate == 0 &&
+                      !FindCarriage(container, plan.codec->code).steadyPictures;
     if (options.nPiece == kWriterPiecePictures) {
         if (options.bPieceContinues != 0)
             plan.tickBefore = options.llPieceTick;
@@ -182,6 +194,7 @@ SoundPlan MakeSoundPlan(const EncodeParam& param, const AudioFormat& source, con
     plan.settings.maxBitrate = param.nAudioRateMode != 0 ? std::max(0, param.nAudioMaxBitrate) : 0;
     const Carriage& carriage = FindCarriage(container, plan.codec->code);
     plan.settings.sampleRates = carriage.sampleRates;
+    plan.settings.maxBits = carriage.maxBits;
     plan.fillsStart = container.kind == ContainerKind::kSteadyRate;
     plan.neverEmpty = carriage.describedByPacket;
     if (plan.settings.sampleRate <= 0 || plan.settings.channels <= 0)

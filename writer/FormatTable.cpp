@@ -65,6 +65,9 @@ constexpr const char* kX265Options = "x265-params=log-level=none:frame-threads=1
 constexpr const char* kVpxOptions = "deadline=good";
 constexpr const char* kFfv1Options = "level=3,g=1,slicecrc=1"; // every picture by itself, with a check sum
 
+constexpr std::array kMpeg2Rates{AVRational{24000, 1001}, AVRational{24, 1}, AVRational{25, 1},
+                                 AVRational{30000, 1001}, AVRational{30, 1}, AVRational{50, 1},
+                                 AVRational{60000, 1001}, AVRational{60, 1}, AVRational{0, 1}};
 constexpr std::array kPictureCodecs{
     PictureCodec{kXvid,  AV_CODEC_ID_MPEG4,      "mpeg4",      kPlanar,     false, false, 0.0, kQuantiser, kOneSpeed, kNotAhead, ""},
     PictureCodec{kH264,  AV_CODEC_ID_H264,       "libx264",    kPlanar,     false, true,  2.0, kCrf51, kX26Speeds, kX264Ahead, ""},
@@ -74,7 +77,7 @@ constexpr std::array kPictureCodecs{
     PictureCodec{kVp9,   AV_CODEC_ID_VP9,        "libvpx-vp9", kPlanar,     true,  false, 1.0, kCrf63, kVpxSpeeds, kNotAhead, kVpxOptions},
     PictureCodec{kAv1,   AV_CODEC_ID_AV1,        "libsvtav1",  kPlanar,     true,  true,  0.0, kCrf63, kAv1Speeds, kNotAhead, ""},
     PictureCodec{kFfv1,  AV_CODEC_ID_FFV1,       "ffv1",       kPlanar,     true,  false, 1.0, kNoQuality, kOneSpeed, kNotAhead, kFfv1Options},
-    PictureCodec{kMpeg2, AV_CODEC_ID_MPEG2VIDEO, "mpeg2video", kPlanar,     false, false, 0.0, kQuantiser, kOneSpeed, kNotAhead, ""},
+    PictureCodec{kMpeg2, AV_CODEC_ID_MPEG2VIDEO, "mpeg2video", kPlanar,     false, false, 0.0, kQuantiser, kOneSpeed, kNotAhead, "", 0, kMpeg2Rates.data()},
     PictureCodec{kFlv1,  AV_CODEC_ID_FLV1,       "flv",        kPlanar,     false, false, 0.0, kQuantiser, kOneSpeed, kNotAhead, ""},
     PictureCodec{kGif,   AV_CODEC_ID_GIF,        "gif",        kPalette,    false, false, 0.0, kNoQuality, kOneSpeed, kNotAhead, "", 600},
 };
@@ -177,6 +180,7 @@ constexpr std::array kContainers{
 };
 
 constexpr std::array kFlashRates{44100, 22050, 11025, 0};
+constexpr std::array kStandardMp3Rates{48000, 44100, 32000, 24000, 22050, 16000, 0};
 constexpr std::array kCarriages{
     Carriage{FourCC("MOV "), kXvid, kXvid},
     Carriage{FourCC("AVI "), kXvid, kXvid},
@@ -190,6 +194,10 @@ constexpr std::array kCarriages{
     Carriage{FourCC("MOV "), kEac3, 0, true},
     Carriage{FourCC("M4A "), kEac3, 0, true},
     Carriage{FourCC("FLV "), kMp3, 0, false, kFlashRates.data()},
+    Carriage{FourCC("MP4 "), kMp3, 0, false, kStandardMp3Rates.data()},
+    // A frame of more than 768 bytes a channel counts as two there, and encoders go above their rate.
+    Carriage{FourCC("AVI "), kAac, 0, false, nullptr, 4.0},
+    Carriage{FourCC("MPG "), kMpeg2, 0, false, nullptr, 0, true},
 };
 
 /// Other names under which a codec is asked for, in capitals.

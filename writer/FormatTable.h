@@ -54,6 +54,7 @@ struct PictureCodec {
     std::array<int, 7> looksAhead;
     const char* options; ///< For the encoder in any case, as "name=value,...".
     int longest = 0; ///< Seconds that a picture can be shown before it has to be there again; 0: any time.
+    const AVRational* rates = nullptr; ///< All that every player knows, rising, ended by 0; null: any rate.
 };
 
 /// A codec for sound.
@@ -75,6 +76,8 @@ struct Carriage {
     /// The file's description of the stream is made from its first packet, so that there has to be one.
     bool describedByPacket = false;
     const int* sampleRates = nullptr; ///< The only ones, ended by 0; null: as the codec has them.
+    double maxBits = 0; ///< Most bits per sample and channel where that is less than the codec has; else 0.
+    bool steadyPictures = false; ///< Readers find the times of pictures by counting.
 };
 
 /// How a file can be kept playable while it grows, and what a container cannot express.

@@ -332,7 +332,10 @@ int MWPlanTicks(const EncodeParam* param, const VideoFormat* video, const int64_
     return Guarded(0, [&] {
         if (param == nullptr || video == nullptr || times == nullptr || ticks == nullptr)
             return 0;
-        const writer::FilePlan plan = writer::MakeFilePlan(*param, video, nullptr, WriterOptions{}, Extras{});
+        const std::shared_ptr<OptionSet> set = OptionSets::Instance().Named(param);
+        if (!set)
+            return 0;
+        const writer::FilePlan plan = writer::MakeFilePlan(*param, video, nullptr, set->Options(), Extras{});
         if (!plan.pictures)
             return 0;
         writer::PicturePacer pacer(plan.pictures->clock, plan.pictures->keepStamps);

@@ -69,11 +69,12 @@ int64_t NearestMp2Rate(int64_t asked, int sampleRate) {
     return rates.back() * 1000;
 }
 
-int64_t ClampBitrate(const SoundCodec& codec, int64_t asked, const AVCodecContext& context) {
+int64_t ClampBitrate(const SoundCodec& codec, const SoundSettings& settings, const AVCodecContext& context) {
     const double samples = static_cast<double>(context.sample_rate) * context.ch_layout.nb_channels;
-    const auto most = static_cast<int64_t>(codec.maxBits * samples);
+    const double bits = settings.maxBits > 0 ? std::min(codec.maxBits, settings.maxBits) : codec.maxBits;
+    const auto most = static_cast<int64_t>(bits * samples);
     const auto least = static_cast<int64_t>(codec.minBits * samples);
-    return std::clamp(asked, least, most);
+    return std::clamp(settings.bitrate, least, most);
 }
 
 } // namespace
@@ -90,7 +91,7 @@ SoundEncoder::SoundEncoder(const SoundCodec& codec, const SoundSettings& setting
     context.sample_fmt = ChooseSampleFormat(*context.codec, settings.bitsPerSample, codec.maxBits == 0);
     ChooseLayout(*context.codec, std::min(settings.channels, codec.maxChannels), context.ch_layout);
     if (codec.maxBits > 0) {
-        context.bit_rate = ClampBitrate(codec, settings.bitrate, context);
+        context.bit_rate = ClampBitrate(codec, settings, context);
         if (codec.id == AV_CODEC_ID_MP2)
             context.bit_rate = NearestMp2Rate(context.bit_rate, context.sample_rate);
         context.rc_max_rate = settings.maxBitrate > 0 ? std::max(settings.maxBitrate, context.bit_rate) : 0;

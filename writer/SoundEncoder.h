@@ -17,6 +17,7 @@ struct SoundSettings {
     int64_t bitrate;
     int64_t maxBitrate;     ///< Upper rate; 0: no limit.
     const int* sampleRates; ///< The only ones, ended by 0; null: as the encoder has them.
+    double maxBits;         ///< Most bits per sample and channel beside the codec's own limit; 0: none.
 };
 
 /// Packets carry the time of their first sample, in sample frames since the first one; it can be below 0

@@ -190,6 +190,9 @@ typedef struct WriterOptions {
     /// Nonzero: the sound that is written tells how long files are and does not go into them. Their sound are
     /// tracks (MWAddTrack).
     int32_t bSoundBeside;
+    /// Nonzero: pictures come exactly at EncodeParam's rate, left out or repeated. By default a source of the
+    /// same rate keeps its own times, but in MPG, and MPEG-2 comes at the next rate above that it has.
+    int32_t bSteadyRate;
 } WriterOptions;
 
 /// What a piece holds.
@@ -361,8 +364,8 @@ int MWGetThreadFileStatus(WriterStatus* status);
 
 /// The ticks of a file's pictures, by which a piece goes on where another one ends: for each of `count`
 /// rising times in the file (100 ns units, the first is 0) that of the picture shown last before it, or
-/// kWriterNoTick. The parameters are those of MWCreateMediaFile. Returns 1; 0 when they make no sense or
-/// there is no memory.
+/// kWriterNoTick. The parameters are those of MWCreateMediaFile, whose options count as well. Returns 1; 0
+/// when they make no sense or there is no memory.
 int MWPlanTicks(const EncodeParam* param, const VideoFormat* video, const int64_t* times, int64_t count,
                 int64_t* ticks);
 

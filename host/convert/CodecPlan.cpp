@@ -158,6 +158,7 @@ PicturePlan PlanPictures(const Request& request, const FileFormatInfo& format,
     if (!plan.frameRate && preferences.maxFrameRate &&
         source.frameRate > *preferences.maxFrameRate * kSameRate)
         plan.frameRate = preferences.maxFrameRate;
+    plan.steadyRate = plan.frameRate.has_value();
     if (!plan.frameRate && isGif && source.frameRate > 0)
         plan.frameRate = GifRate(source.frameRate);
     plan.speed = request.speed ? request.speed : preferences.speed;

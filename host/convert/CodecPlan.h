@@ -16,6 +16,7 @@ struct PicturePlan {
     std::optional<uint32_t> codec;
     std::optional<Size> size;
     std::optional<double> frameRate;
+    bool steadyRate = false;       ///< It was asked for, so that even a source of that rate is brought to it.
     std::optional<double> quality; ///< Instead of a rate.
     std::optional<int32_t> rate;   ///< Bits per second.
     std::optional<int32_t> maxRate;

@@ -76,6 +76,7 @@ WriterWatch::WriterWatch(const Request& request, const SourceInfo& source, Bell&
         writer.nSpeed = plan.speed ? static_cast<int32_t>(*plan.speed) : 0;
         writer.nProfile = plan.profile ? static_cast<int32_t>(*plan.profile) : 0;
         writer.nDepth = plan.depth;
+        writer.bSteadyRate = plan.steadyRate ? 1 : 0;
         TellColours(writer, *source.pictures, plan.keepsHdr);
     }
     writer.bKeepExisting = request.overwrite ? 0 : 1;

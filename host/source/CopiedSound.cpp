@@ -50,6 +50,14 @@ bool HasAdtsHeader(const AVPacket& packet) {
     return packet.size > 7 && packet.data[0] == 0xFF && (packet.data[1] & 0xF6) == 0xF0;
 }
 
+/// Whether it is the rest of a frame whose start is missing, as at the start of a recording that was cut.
+bool IsTail(const AVPacket& packet, AVCodecID codec) {
+    if (codec != AV_CODEC_ID_AC3 && codec != AV_CODEC_ID_EAC3)
+        return false;
+    const int word = packet.size >= 2 ? AV_RB16(packet.data) : 0;
+    return word != 0x0B77 && word != 0x770B;
+}
+
 int64_t SampleBytes(const AVCodecParameters& parameters) {
     const bool isPcm =
         parameters.codec_id >= AV_CODEC_ID_FIRST_AUDIO && parameters.codec_id < AV_CODEC_ID_ADPCM_IMA_QT;
@@ -196,7 +204,7 @@ bool CopiedSound::Cut(Held& first, int64_t until, bool closing) {
 }
 
 void CopiedSound::Hold(av::Packet packet) {
-    if (packet->size <= 0)
+    if (packet->size <= 0 || (!timeline_ && IsTail(*packet, parameters_->codec_id)))
         return;
     if (deframer_ && HasAdtsHeader(*packet) && !deframer_->Filter(*packet))
         return;

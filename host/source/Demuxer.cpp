@@ -6,6 +6,7 @@
 #include <cstdlib>
 #include <limits>
 #include <new>
+#include <string_view>
 #include <utility>
 
 namespace movieconv {
@@ -56,13 +57,22 @@ bool Demuxer::Seek(double seconds) {
     return soughtWell_;
 }
 
+/// Whether FFmpeg gives other stamps where it seeks than where it reads on.
+bool Demuxer::SeeksAstray() const {
+    const std::string_view container = source_.Reader().Context()->iformat->name;
+    if (container != "ogg" || source_.SoundStream() == nullptr)
+        return container == "ogg";
+    const AVCodecID sound = source_.SoundStream()->codecpar->codec_id;
+    return source_.PictureStream() != nullptr || (sound != AV_CODEC_ID_VORBIS && sound != AV_CODEC_ID_OPUS);
+}
+
 /// Goes to a time from which `seconds` can be decoded. Containers seek by decoding order or land beside a key
 /// picture, so it goes back until one lies before. False when there is none after the source's start.
 bool Demuxer::SeekBefore(double seconds) {
     AVFormatContext* context = source_.Reader().Context();
     const int64_t start = context->start_time != AV_NOPTS_VALUE ? context->start_time : 0;
     double back = kPreroll;
-    while (back < seconds) {
+    while (back < seconds && !SeeksAstray()) {
         const int64_t target = start + std::llround((seconds - back) * AV_TIME_BASE);
         const auto seek = [&] { return avformat_seek_file(context, -1, INT64_MIN, target, target, 0) >= 0; };
         if (!seek())

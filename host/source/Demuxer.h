@@ -104,6 +104,7 @@ private:
     std::size_t Held() const;
     bool AwaitDemand();
     bool ReadOne();
+    bool SeeksAstray() const;
     bool SeekBefore(double seconds);
     bool KeyPictureAtOrBefore(int64_t mediaTime);
     bool Holds(std::size_t packets, std::size_t bytes) const;

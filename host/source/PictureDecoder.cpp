@@ -147,6 +147,8 @@ void PictureDecoder::DecodeAll() {
 }
 
 bool PictureDecoder::Accept(AVFrame& frame) {
+    if ((frame.flags & AV_FRAME_FLAG_DISCARD) != 0) // cut off by the container; not every decoder keeps it
+        return true;
     if (skip_ > 0) {
         --skip_;
         return true;

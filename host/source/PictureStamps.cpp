@@ -103,16 +103,17 @@ std::optional<int64_t> PictureStamps::NextShown() {
 /// Whether a packet becomes a picture that is shown, at a time that it tells.
 bool PictureStamps::IsShown(const AVPacket& packet) {
     constexpr int kVp8ShowFrame = 0x10;
+    const bool isStamped = packet.pts != AV_NOPTS_VALUE;
+    if (!firstKey_ && isStamped && (packet.flags & AV_PKT_FLAG_KEY) != 0) // though it may not be shown
+        firstKey_ = packet.pts;
     if ((packet.flags & AV_PKT_FLAG_DISCARD) != 0 || packet.size <= 0)
         return false;
     if (codec_ == AV_CODEC_ID_VP8 && (packet.data[0] & kVp8ShowFrame) == 0)
         return false;
-    if (packet.pts == AV_NOPTS_VALUE) {
+    if (!isStamped) {
         ++unstamped_;
         return false;
     }
-    if (!firstKey_ && (packet.flags & AV_PKT_FLAG_KEY) != 0)
-        firstKey_ = packet.pts;
     return firstKey_ &&
            packet.pts >= *firstKey_; // what is shown earlier builds on pictures that are not there
 }

@@ -7,6 +7,7 @@
 
 #include <algorithm>
 #include <cmath>
+#include <cstring>
 #include <limits>
 #include <optional>
 #include <utility>
@@ -215,8 +216,10 @@ void FindPromise(const MovieReader& reader, SourceInfo& info, bool measured) {
     if (measured || (context.iformat->flags & AVFMT_TS_DISCONT) != 0 ||
         context.duration_estimation_method != AVFMT_DURATION_FROM_STREAM)
         return;
+    // There each stream is given the length of the whole file.
+    const bool oneLength = std::strcmp(context.iformat->name, "asf") == 0;
     const auto announced = [&](const auto& stream) -> std::optional<double> {
-        if (!stream)
+        if (!stream || oneLength)
             return std::nullopt;
         const double end = stream->duration > 0
                                ? stream->duration

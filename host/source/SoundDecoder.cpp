@@ -29,6 +29,7 @@ SoundDecoder::SoundDecoder(const Source& source, Demuxer& demuxer, Failures& fai
     : demuxer_(demuxer),
       failures_(failures),
       stream_(source.SoundStream()->index),
+      besidePictures_(source.Info().pictures.has_value()),
       decoder_(source.Reader(), *source.SoundStream(), *source.Info().sound,
                {[this](PcmDecoder::Chunk chunk) { return Push(std::move(chunk)); },
                 [this](int64_t samples) { return PushSilence(samples); }}),
@@ -115,6 +116,9 @@ void SoundDecoder::DecodeAll() {
         goesOn = decoder_.Decode(std::get<av::Packet>(taken).get());
         damaged_ = decoder_.Damaged();
     }
+    // Begun behind the sound's end: a block to say where, or the silence for the pictures would begin at 0.
+    if (begin_ > 0 && besidePictures_ && !pushed_)
+        Push(PcmDecoder::Chunk(static_cast<std::size_t>(blockBytes_)));
 }
 
 bool SoundDecoder::PushSilence(int64_t samples) {
@@ -129,6 +133,7 @@ bool SoundDecoder::PushSilence(int64_t samples) {
 
 bool SoundDecoder::Push(PcmDecoder::Chunk chunk) {
     const std::size_t bytes = chunk.size();
+    pushed_ = true;
     refused_ = !queue_.Push(std::move(chunk), bytes);
     return !refused_;
 }

@@ -48,6 +48,7 @@ private:
     Demuxer& demuxer_;
     Failures& failures_;
     const int stream_;
+    const bool besidePictures_;
     AudioSourceInfo info_{};
     int64_t frameBytes_ = 0; // of one sample of all channels
     int64_t blockBytes_ = 0;
@@ -55,6 +56,7 @@ private:
 
     // The decoding thread's.
     PcmDecoder decoder_;
+    bool pushed_ = false;  // some sound
     bool refused_ = false; // nobody takes sound any more
 
     // Between the threads.

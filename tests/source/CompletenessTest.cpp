@@ -92,6 +92,9 @@ TEST(Sources, AreWholeWhenOnlyAnotherStreamPromisesMore) {
         EXPECT_FALSE(MissingIn(path)) << name;
         EXPECT_FALSE(MissingIn(path, {.sound = false})) << name;
     }
+    // Every stream is told to be as long as the file.
+    EXPECT_FALSE(MissingIn(
+        Make("shorter-sound.asf", Join(CountedPictures(4), Beeps(2), Words("-c:v wmv2 -c:a wmav2")))));
     // The last picture stays for long, and says so.
     EXPECT_FALSE(
         MissingIn(Make("staying.mp4", Join(CountedPictures(14), Beeps(14),

@@ -102,6 +102,26 @@ TEST_P(DecodersFrom, GiveEveryPictureOnceWithItsTimeAndAllSound) {
 INSTANTIATE_TEST_SUITE_P(Begins, DecodersFrom, testing::ValuesIn(kBegins),
                          [](const auto& test) { return test.param.name; });
 
+// Where FFmpeg's own seeking leads astray.
+TEST(Decoders, FindATimeInSoundAlone) {
+    const struct {
+        const char* name;
+        Args encoding;
+    } cases[] = {{"beeps-flac.ogg", Words("-c:a flac -ar 48000")},
+                 {"beeps-speex.ogg", Words("-c:a libspeex -ar 16000")},
+                 {"beeps-vorbis.ogg", Words("-c:a libvorbis -ar 48000")}};
+    for (const auto& test : cases)
+        for (const double begin : {2.5, 8.75}) {
+            SCOPED_TRACE(std::string(test.name) + " from " + std::to_string(begin));
+            Movie movie(Make(test.name, Join(Beeps(12), test.encoding)), {});
+            const int rate = movie.Sound()->GetAudioInfo()->format.nSampleRate;
+            const std::vector<double> beeps = Beginnings(TakeAll(movie, begin), rate);
+            ASSERT_FALSE(beeps.empty());
+            EXPECT_NEAR(beeps.front(), std::ceil(begin), 0.02);
+            EXPECT_NEAR(beeps.back(), 11, 0.02);
+        }
+}
+
 TEST(Decoders, DoNotCountTheFrameThatASeekCutsAsDamaged) {
     Movie movie(Make("counted.mpg", Join(CountedPictures(4), Beeps(4), Args{"-c:v", "mpeg2video"})), {});
     TakeAll(movie, 1.23);

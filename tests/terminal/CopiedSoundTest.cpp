@@ -19,18 +19,20 @@ using program::Call;
 using program::Result;
 
 using test_movies::Args;
+using test_movies::Beeps;
 using test_movies::CountedPictures;
 using test_movies::FfmpegReads;
 using test_movies::Ffprobe;
 using test_movies::Join;
 using test_movies::Lavfi;
+using test_movies::Make;
 using test_movies::Words;
 
 /// Three seconds of pictures and sound of two channels in that codec.
 std::string WithSound(const std::string& name, const std::string& codec) {
-    return test_movies::Make(name, Join(CountedPictures(3),
-                                        Lavfi("aevalsrc=0.4*sin(500*t*t)|0.3*sin(400*t*t):s=48000:d=3"),
-                                        Words("-c:v mpeg4 -strict -2 " + codec)));
+    return Make(name,
+                Join(CountedPictures(3), Lavfi("aevalsrc=0.4*sin(500*t*t)|0.3*sin(400*t*t):s=48000:d=3"),
+                     Words("-c:v mpeg4 -strict -2 " + codec)));
 }
 
 /// What a packet of sound holds, and when it is heard.
@@ -226,6 +228,23 @@ TEST(CopiedSound, OfSeveralTracksIsCarriedAsFarAsTheFormatHoldsIt) {
             .code,
         0);
     EXPECT_EQ(ContentsOf(PacketsOf(folder / "pieces.mkv")), ContentsOf(PacketsOf(source)));
+}
+
+// A recording that was cut begins amid a frame, of which nothing can be heard.
+TEST(CopiedSound, LeavesTheRestOfACutFrameOut) {
+    const Folder folder;
+    const std::string whole =
+        Make("cut-ac3.mpg",
+             Join(CountedPictures(4), Beeps(4), Words("-c:v mpeg2video -b:v 900k -c:a ac3 -ar 48000")));
+    for (const std::size_t from : {10001U, 20001U}) {
+        WriteFile(folder / "in.mpg", ReadFile(whole).substr(from));
+        for (const char* name : {"out.mp4", "out.mkv"}) {
+            const Result result =
+                Call({"-q", "-y", "--audio-codec", "copy", folder / "in.mpg", folder / name});
+            EXPECT_EQ(result.code, 0) << from << name << result.err;
+            EXPECT_GT(PacketsOf(folder / name).size(), 20U);
+        }
+    }
 }
 
 } // namespace

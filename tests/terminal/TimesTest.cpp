@@ -1,0 +1,122 @@
+// Pictures and sound at their times, where source, format or options make that hard.
+#include "tests/support/Inspect.h"
+#include "tests/support/Program.h"
+#include "tests/support/TestMovies.h"
+
+#include <gtest/gtest.h>
+
+#include <cmath>
+#include <string>
+#include <vector>
+
+namespace {
+
+using namespace test_movies;
+using inspect::Seen;
+using program::Call;
+using program::Result;
+
+Seen Convert(const std::string& source, const Args& options, const char* format) {
+    const Folder folder;
+    const std::string output = folder / (std::string("out.") + format);
+    const Result result = Call(Join(Args{"-q", "--speed", "fastest", source, output}, options));
+    EXPECT_EQ(result.code, 0) << result.err;
+    return result.code == 0 ? inspect::LookAt(output) : Seen{};
+}
+
+TEST(Times, OfARangeBehindTheSoundAreThoseOfItsPictures) {
+    const std::string source =
+        Make("short-sound.mp4", Join(CountedPictures(6), Beeps(2), NearLossless(), Args{"-c:a", "aac"}));
+    for (const Args& options : {Args{}, Args{"--jobs", "2", "--piece-length", "0.5"}}) {
+        const Seen seen = Convert(source, Join(Args{"--begin", "4", "--length", "1"}, options), "mkv");
+        ASSERT_EQ(seen.pictures.size(), 25U);
+        for (int i = 0; i < 25; ++i)
+            EXPECT_NEAR(seen.pictures[static_cast<std::size_t>(i)].luma, LumaOf(100 + i), 1);
+        EXPECT_NEAR(static_cast<double>(seen.sound.size()) / 44100, 1, 0.08);
+    }
+}
+
+TEST(Times, OfAMovieThatWasCutByAnEditListAreTheSameInPieces) {
+    for (const char* codec : {"libx264", "mjpeg"}) {
+        SCOPED_TRACE(codec);
+        const std::string whole = Make(
+            std::string("uncut-") + codec + ".mov",
+            Join(CountedPictures(3), Beeps(3), Args{"-c:v", codec, "-q:v", "2", "-g", "50", "-c:a", "aac"}));
+        const std::string cut =
+            Make(std::string("cut-") + codec + ".mov", {"-ss", "0.5", "-i", whole, "-c", "copy"});
+        for (const Args& options : {Args{}, Args{"--jobs", "2", "--piece-length", "1"}}) {
+            const Seen seen = Convert(cut, options, "mkv");
+            ASSERT_NEAR(static_cast<double>(seen.pictures.size()), 62, 1);
+            EXPECT_NEAR(seen.pictures[1].luma, LumaOf(75 - static_cast<int>(seen.pictures.size()) + 1), 2);
+            EXPECT_NEAR(seen.pictures.back().luma, LumaOf(74), 2);
+        }
+    }
+}
+
+TEST(Times, OfFewPicturesAreKeptByRepeatingThem) {
+    const std::string source =
+        Make("few.mkv", Join(FlashPictures(6), Beeps(6), NearLossless(),
+                             Args{"-vf", "select='not(mod(n,25))+not(mod(n-2,25))+not(mod(n-13,50))'",
+                                  "-fps_mode", "passthrough"}));
+    const struct {
+        const char* format;
+        Args options;
+        double pictures; // the last one's end is not told
+    } cases[] = {{"mp4", {}, 15}, {"mp4", {"--frame-rate", "25"}, 128}, {"mpg", {}, 128}};
+    for (const auto& test : cases) {
+        SCOPED_TRACE(std::string(test.format) + (test.options.empty() ? "" : " steady"));
+        for (const Args& pieces : {Args{}, Args{"--jobs", "2", "--pieces", "3"}}) {
+            const Seen seen = Convert(source, Join(test.options, pieces), test.format);
+            EXPECT_NEAR(static_cast<double>(seen.pictures.size()), test.pictures, 2);
+            const std::vector<double> flashes = inspect::Flashes(seen);
+            const std::vector<double> beeps = inspect::Beginnings(seen, 44100);
+            ASSERT_EQ(flashes.size(), beeps.size());
+            for (std::size_t i = 0; i < flashes.size(); ++i)
+                EXPECT_NEAR(flashes[i], beeps[i], 0.05);
+        }
+    }
+}
+
+// MPEG-2 has few rates; one that nobody asked for is brought to the next one.
+TEST(Times, OfMpeg2AreThoseOfOneOfItsRates) {
+    const std::string source =
+        Make("mean-rate.mp4",
+             Join(FlashPictures(4), Beeps(4), NearLossless(),
+                  Args{"-vf", "select='lt(t,2.5)+gt(t,2.9)'", "-fps_mode", "passthrough", "-c:a", "aac"}));
+    for (const char* format : {"mpg", "mkv"}) {
+        SCOPED_TRACE(format);
+        const Seen seen = Convert(source, {"--video-codec", "MPG2"}, format);
+        EXPECT_GE(seen.pictures.size(), 90U);
+        const std::vector<double> flashes = inspect::Flashes(seen);
+        const std::vector<double> beeps = inspect::Beginnings(seen, 44100);
+        ASSERT_EQ(flashes.size(), beeps.size());
+        for (std::size_t i = 0; i < flashes.size(); ++i)
+            EXPECT_NEAR(flashes[i], beeps[i], 0.05);
+    }
+    const Folder folder;
+    EXPECT_EQ(Call({"-q", "--frame-rate", "21.3", source, folder / "out.mpg"}).code, 2);
+}
+
+// What formats hold of a codec at low sampling rates.
+TEST(Times, OfSoundOfLowRates) {
+    const std::string source = Make("beeps.mkv", Join(CountedPictures(4), Beeps(4), NearLossless()));
+    for (const auto& [codec, format] : {std::pair{"MP3", "mp4"}, {"AAC", "avi"}, {"AAC", "mp4"}}) {
+        SCOPED_TRACE(std::string(codec) + " in " + format);
+        const Folder folder;
+        const std::string output = folder / (std::string("out.") + format);
+        const Result result = Call({"-q", "--audio-codec", codec, "--sample-rate", "8000", "--channels", "1",
+                                    "--video-codec", "XVID", source, output});
+        ASSERT_EQ(result.code, 0) << result.err;
+        movieconv::Movie movie(output, {});
+        const int rate = movie.Sound()->GetAudioInfo()->format.nSampleRate;
+        EXPECT_EQ(rate, std::string(codec) == "MP3" ? 16000 : 8000);
+        const Seen seen = inspect::TakeAll(movie);
+        EXPECT_NEAR(static_cast<double>(seen.sound.size()) / rate, 4, 0.2);
+        const std::vector<double> beeps = inspect::Beginnings(seen, rate);
+        ASSERT_EQ(beeps.size(), 4U);
+        for (std::size_t i = 0; i < 4; ++i)
+            EXPECT_NEAR(beeps[i], static_cast<double>(i), 0.08);
+    }
+}
+
+} // namespace
