@@ -13,7 +13,7 @@ App::App(Runner& runner, Settings& settings, const std::string& journal)
     : settings_(settings),
       journal_(journal,
                [this](const QString& sentence) {
-                   QMetaObject::invokeMethod(&queue_,
+                   QMetaObject::invokeMethod(&teller_,
                                              [this, sentence] { Q_EMIT queue_.Complaint(sentence); });
                }),
       queue_(runner, journal_),

@@ -41,6 +41,7 @@ private:
     void Raise();
 
     Settings& settings_;
+    QObject teller_; // by which the journal's thread tells, and which outlives it
     Journal journal_;
     Queue queue_;
     Dispatcher dispatcher_;

@@ -144,7 +144,14 @@ TEST(Journal, SetsAsideWhatItCannotRead) {
         EXPECT_TRUE(complaint.contains(QStringLiteral("queue.unreadable"))) << text;
         EXPECT_EQ(ReadFile(folder / "queue.unreadable"), text);
     }
-    const Folder folder;
+    const Folder folder; // what cannot be opened, beside what was set aside before
+    std::filesystem::create_directory(folder / "closed");
+    WriteFile(folder / "closed.unreadable", "older");
+    QString complaint;
+    EXPECT_TRUE(Journal(folder / "closed", Ignore).Load(complaint).empty());
+    EXPECT_TRUE(complaint.contains(QStringLiteral("closed.unreadable-2")));
+    EXPECT_TRUE(std::filesystem::is_directory(folder / "closed.unreadable-2"));
+    EXPECT_EQ(ReadFile(folder / "closed.unreadable"), "older");
     WriteFile(folder / "queue", R"({"version":1,"entries":[5,{},{"source":"/a","state":"odd"},
         {"source":"/b","state":"waiting","wishes":{"quality":"high","height":-3,"begin":"x","sounds":7,
         "burnt_track":-2,"burnt_file":5,"copy_sound":"yes"}}]})");

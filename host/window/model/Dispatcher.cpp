@@ -112,6 +112,7 @@ void Dispatcher::StopAll() {
     stopAfterThis_ = true;
     for (auto& [id, active] : active_)
         active.run->Stop();
+    Fill(); // where nothing runs, that is the end
     Q_EMIT Progressed();
 }
 

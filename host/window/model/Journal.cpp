@@ -46,7 +46,17 @@ bool Replace(const std::string& path, const QByteArray& bytes) {
     if (std::rename(temporary.c_str(), path.c_str()) != 0)
         return false;
     const Descriptor folder(open(text::FolderOf(path).c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC));
-    return folder.number >= 0 && fsync(folder.number) == 0;
+    if (folder.number >= 0)
+        fsync(folder.number); // some file systems cannot; the queue is there all the same
+    return true;
+}
+
+/// Where the file is afterwards: under a name of its own, or where it was.
+std::string SetAside(const std::string& path) {
+    std::string aside = path + ".unreadable";
+    for (int number = 2; access(aside.c_str(), F_OK) == 0; ++number)
+        aside = path + ".unreadable-" + std::to_string(number);
+    return std::rename(path.c_str(), aside.c_str()) == 0 ? aside : path;
 }
 
 QByteArray Serialise(const std::vector<Entry>& entries) {
@@ -93,12 +103,14 @@ std::vector<Entry> Journal::Load(QString& complaint) {
         return {};
     }
     QFile file(QFile::decodeName(path_.c_str()));
-    if (!file.open(QIODevice::ReadOnly))
+    if (!file.exists())
         return {};
+    file.open(QIODevice::ReadOnly); // what cannot be opened is not the queue either
     const QJsonObject json = QJsonDocument::fromJson(file.readAll()).object();
     if (json[QLatin1String("version")].toInt() != kVersion) {
-        const std::string aside = path_ + ".unreadable";
-        std::rename(path_.c_str(), aside.c_str());
+        file.close();
+        const std::string aside = SetAside(path_);
+        own_ = aside != path_; // else it must not be replaced
         complaint =
             QCoreApplication::translate("Journal", "The saved queue could not be read. It was kept as %1.")
                 .arg(Readable(aside));

@@ -489,6 +489,10 @@
         <translation>es ist kein Film, sondern sagt, wo einer zu finden ist</translation>
     </message>
     <message>
+        <source>it asks for more memory than there is</source>
+        <translation>es verlangt mehr Speicher, als da ist</translation>
+    </message>
+    <message>
         <source>it is a playlist, which names other files</source>
         <translation>es ist eine Abspielliste, die andere Dateien nennt</translation>
     </message>
@@ -499,6 +503,10 @@
     <message>
         <source>reading “%1” failed after %2: %3; what was read is converted</source>
         <translation>„%1“ war nur bis %2 zu lesen: %3; was gelesen wurde, ist umgewandelt</translation>
+    </message>
+    <message>
+        <source>reading “%1” failed after %2: %3</source>
+        <translation>„%1“ war nur bis %2 zu lesen: %3</translation>
     </message>
     <message>
         <source>the conversion broke off after %1</source>
