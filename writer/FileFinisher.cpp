@@ -2,6 +2,7 @@
 
 #include "platform/LogRoute.h"
 #include "writer/Fragments.h"
+#include "writer/Mp4Index.h"
 #include "writer/WriterFailure.h"
 #include "writer/WriterStatus.h"
 
@@ -49,7 +50,8 @@ void FileFinisher::TellLengths() {
     });
 }
 
-/// The fragmented file is a whole movie too: it takes the name when there is no room or memory for the index.
+/// The fragmented file is a whole movie too: it takes the name when there is no room or memory for the index,
+/// unless something comes with the index alone.
 void FileFinisher::FinishInPlace() {
     try {
         FinishFragments(part_.File(), part_.Streams(), *plan_.container, part_.Fragments(), *part_.Room(),
@@ -58,7 +60,7 @@ void FileFinisher::FinishInPlace() {
                         });
     } catch (...) {
         const WriterFailure failure = FailureOf(std::current_exception());
-        if (failure.Kind() == kWriterErrorFinish)
+        if (failure.Kind() == kWriterErrorFinish || NeedsIndex(extras_))
             throw;
         WriteLog(kLogWarning, "Keeping the fragmented form of \"%s\": %s", target_.c_str(), failure.what());
     }

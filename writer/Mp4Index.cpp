@@ -38,6 +38,10 @@ bool HasTimecode(const Extras& extras) {
 
 } // namespace
 
+bool NeedsIndex(const Extras& extras) {
+    return !extras.chapters.empty() || extras.cover.data || HasTimecode(extras);
+}
+
 /// Drops what is written to it, but for the end.
 class Mp4Index::Sink final : public ByteFile {
 public:

@@ -16,6 +16,9 @@
 
 namespace writer {
 
+/// Whether something of these comes into a file with its index alone.
+bool NeedsIndex(const Extras& extras);
+
 /// Streams are added, then packets in the order of the file, then the index is taken. All functions throw
 /// WriterFailure (kWriterErrorEncode, or kWriterErrorFinish for a packet of a stream that there is not) or
 /// std::bad_alloc.

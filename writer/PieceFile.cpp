@@ -133,7 +133,11 @@ void Describe(Sink& sink, const MuxedStream& stream, AVCodecParameters& paramete
     }
     sink.Number(stream.runUp);
     sink.Number(stream.carriage->codec);
+    const AVChannelLayout layout = parameters.ch_layout;
+    if (layout.order == AV_CHANNEL_ORDER_CUSTOM) // which is a list elsewhere
+        parameters.ch_layout = {AV_CHANNEL_ORDER_UNSPEC, layout.nb_channels, {0}, nullptr};
     Numbers(parameters, [&sink](const auto& value) { sink.Number(static_cast<int64_t>(value)); });
+    parameters.ch_layout = layout;
     sink.Block(parameters.extradata, parameters.extradata_size);
 }
 
@@ -263,7 +267,13 @@ PieceReader::Description PieceReader::ReadDescription(const uint8_t* data, std::
     Numbers(parameters,
             [&draw](auto& value) { value = static_cast<std::decay_t<decltype(value)>>(draw.Number()); });
     const std::vector<uint8_t> extra = draw.Block();
-    if (!draw.whole || stream.unit.num <= 0 || stream.unit.den <= 0)
+    AVChannelLayout& layout = parameters.ch_layout;
+    const bool isListed = layout.order == AV_CHANNEL_ORDER_CUSTOM;
+    if (isListed) // nothing that could be freed
+        layout = {};
+    const bool isSound = parameters.codec_type == AVMEDIA_TYPE_AUDIO;
+    if (!draw.whole || isListed || (isSound && av_channel_layout_check(&layout) == 0) ||
+        stream.unit.num <= 0 || stream.unit.den <= 0 || stream.rate.den < 0 || stream.sampleAspect.den < 0)
         Refuse();
     if (!extra.empty()) {
         parameters.extradata = static_cast<uint8_t*>(av_mallocz(extra.size() + AV_INPUT_BUFFER_PADDING_SIZE));

@@ -20,6 +20,13 @@ std::optional<Failure> WhyNothingIsThere(const Evidence& evidence) {
 
 } // namespace
 
+std::optional<Failure> FindExcess(const Request& request, const FileLedger& files) {
+    if (!request.maxSize || files.Bytes() <= *request.maxSize)
+        return std::nullopt;
+    return Failure(Category::kOutput, fmt::format("\"{}\" has become larger than asked for: {}",
+                                                  request.output, FormatBytes(files.Bytes())));
+}
+
 std::optional<Failure> FindFailure(const Evidence& evidence) {
     if (evidence.brokenOff)
         return evidence.brokenOff;
@@ -33,14 +40,15 @@ std::optional<Failure> FindFailure(const Evidence& evidence) {
         return WhyNothingIsThere(evidence);
     const std::string& reason = evidence.readError.empty() ? evidence.shortfall : evidence.readError;
     if (!reason.empty() && !evidence.userStopped) {
+        const std::string reached = FormatTime(evidence.reached, true);
         return Failure(Category::kSource,
-                       fmt::format("reading \"{}\" failed after {}: {}; what was read is converted",
-                                   request.input, FormatTime(evidence.reached, true), reason));
+                       request.piece // of which nothing is left
+                           ? fmt::format("reading \"{}\" failed after {}: {}", request.input, reached, reason)
+                           : fmt::format("reading \"{}\" failed after {}: {}; what was read is converted",
+                                         request.input, reached, reason));
     }
-    if (request.maxSize && files.Bytes() > *request.maxSize) {
-        return Failure(Category::kOutput, fmt::format("\"{}\" has become larger than asked for: {}",
-                                                      request.output, FormatBytes(files.Bytes())));
-    }
+    if (const std::optional<Failure> excess = FindExcess(request, files))
+        return excess;
     if (evidence.engineOutcome == kOutcomeCompleted ||
         (evidence.userStopped && evidence.engineOutcome == kOutcomeStopped))
         return std::nullopt;

@@ -22,6 +22,9 @@ struct Evidence {
     double reached = 0;    ///< Seconds, in the source.
 };
 
+/// Whether the files have become larger than the request allows.
+std::optional<Failure> FindExcess(const Request& request, const FileLedger& files);
+
 /// What went wrong first, in the order of what explains most; nothing only when everything that the source
 /// holds, or up to where the user stopped, stands complete under its name.
 std::optional<Failure> FindFailure(const Evidence& evidence);

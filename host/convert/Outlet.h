@@ -42,7 +42,10 @@ public:
         Post([news](Observer& observer) { observer.Showed(news); });
     }
     void Ended(const Verdict& news) override {
-        Post([news](Observer& observer) { observer.Ended(news); });
+        if (loop_)
+            Post([news](Observer& observer) { observer.Ended(news); });
+        else // without a copy, so that it is not lost for want of memory
+            Post([&news](Observer& observer) { observer.Ended(news); });
     }
 
 private:

@@ -127,13 +127,13 @@ Verdict Batch::Perform() {
         throw Failure(Category::kOutput,
                       fmt::format("the folder \"{}\" cannot be made: {}", order_.folder, error.message()));
     journal_.emplace(order_.folder);
+    List();
+    count_ = static_cast<int>(waiting_.size());
+    News().Started({fmt::format("{} {}", count_, count_ == 1 ? "movie" : "movies"), order_.folder, 0, false});
     if (journal_->Damaged() > 0)
         News().Warned({Warning::Kind::kSource,
                        fmt::format("{} lines of the journal in \"{}\" are damaged and not believed",
                                    journal_->Damaged(), order_.folder)});
-    List();
-    count_ = static_cast<int>(waiting_.size());
-    News().Started({fmt::format("{} {}", count_, count_ == 1 ? "movie" : "movies"), order_.folder, 0, false});
     const auto processors = static_cast<int>(std::max(1U, std::thread::hardware_concurrency()));
     WorkOff(order_.jobs > 0 ? order_.jobs : (processors + 1) / 2);
     return Conclude();

@@ -40,7 +40,7 @@ public:
     void Warned(const Warning& news) override { crew_.outlet_.Warned(news); }
     void LeftBehind(const NotCarried& news) override { errand_->LeftBehind(news); }
     void Ended(const Verdict& news) override {
-        concluding_ = news;
+        concluding_ = &news;
         Verdict verdict = Attempt(*this, &Hand::Conclude);
         {
             const std::lock_guard lock(mutex_);
@@ -51,14 +51,15 @@ public:
 
 private:
     Verdict Conclude() {
-        errand_->Conclude(concluding_);
-        return concluding_;
+        Verdict verdict = *concluding_;
+        errand_->Conclude(verdict);
+        return verdict;
     }
 
     Crew& crew_;
     const std::string input_;
     const std::unique_ptr<Errand> errand_;
-    Verdict concluding_;
+    const Verdict* concluding_ = nullptr; // while Ended runs
     mutable std::mutex mutex_;
     Progress latest_;
     std::optional<Verdict> ending_;

@@ -180,11 +180,9 @@ std::optional<Plan> Foreman::Leftover(const Plan& now) {
     }
     if (planned) // nobody has named it, so leave to replace the output is none to replace this
         RequirePlan(order_.planPath);
-    if (!order_.resume && (planned || pieces > 0)) {
-        News().Warned({Warning::Kind::kLeftover,
-                       fmt::format("\"{}\" with {} pieces is left of an earlier run; it is made anew",
-                                   order_.planPath, pieces)});
-    }
+    if (!order_.resume && (planned || pieces > 0))
+        leftover_ = fmt::format("\"{}\" with {} pieces is left of an earlier run; it is made anew",
+                                order_.planPath, pieces);
     RemovePieces(order_.planPath);
     return std::nullopt;
 }
@@ -224,6 +222,8 @@ void Foreman::Announce() {
     earlier_ = done_;
     News().Started({plan_.source.path, order_.only ? PiecePath(order_.planPath, *order_.only) : plan_.output,
                     length_, true});
+    if (!leftover_.empty())
+        News().Warned({Warning::Kind::kLeftover, leftover_});
     if (order_.only && missing_.empty())
         News().Warned({Warning::Kind::kChosen, fmt::format("piece {} is made already", *order_.only)});
     if (order_.request && order_.resume && static_cast<int>(missing_.size()) < plan_.Pieces())

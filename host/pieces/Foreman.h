@@ -66,6 +66,7 @@ private:
     // The foreman's thread's.
     std::deque<int> missing_; // pieces that are to be begun
     std::set<int> fromStart_; // of these, those for which the source is read from its start
+    std::string leftover_;    // what there is to tell of an earlier run
     Verdict verdict_;
     double length_ = 0;  // seconds of all pictures to be converted
     double done_ = 0;    // of the pieces that are made

@@ -7,6 +7,7 @@
 #include "host/convert/Engine.h"
 #include "host/convert/Failure.h"
 #include "host/convert/FileLedger.h"
+#include "host/convert/Judgement.h"
 #include "host/convert/OutputCheck.h"
 #include "host/convert/Sources.h"
 #include "host/convert/Timecode.h"
@@ -106,6 +107,8 @@ Verdict JoinPieces(const Plan& plan, const std::string& planPath, bool replace, 
         verdict.failure = Failure(Category::kOutput, *missing);
     if (!verdict.failure && files.Complete() != 1)
         verdict.failure = Failure(Category::kInternal, "the pieces were not joined");
+    if (!verdict.failure)
+        verdict.failure = FindExcess(request, files);
     verdict.outcome = verdict.failure ? Outcome::kFailed : Outcome::kDone;
     verdict.position = ToSeconds(plan.pictures.back().end - plan.pictures.front().begin);
     verdict.bytes = files.Bytes();

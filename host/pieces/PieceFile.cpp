@@ -47,19 +47,16 @@ int64_t SizeOf(const Descriptor& file) {
 /// The files that belong to a plan of that name, but for itself.
 std::vector<std::filesystem::path> FilesOf(const std::string& planPath) {
     std::vector<std::filesystem::path> found = FilesInTheMaking(planPath);
-    const std::string prefix = std::filesystem::path(planPath).filename().string() + ".";
-    std::error_code error;
-    for (const auto& entry : std::filesystem::directory_iterator(text::FolderOf(planPath), error)) {
-        const std::string name = entry.path().filename().string();
-        if (name.compare(0, prefix.size(), prefix) != 0)
-            continue;
+    const std::string prefix = planPath + ".";
+    for (const std::filesystem::path& file : FilesThatBegin(prefix)) {
+        const std::string name = file.filename().string();
         std::string_view rest(name);
-        rest.remove_prefix(prefix.size());
+        rest.remove_prefix(text::NameOf(prefix).size());
         const std::size_t digits = std::min(rest.find_first_not_of("0123456789"), rest.size());
         rest.remove_prefix(digits);
         if (digits >= 4 &&
             (rest == kSuffix || rest.substr(0, kSuffix.size() + 1) == std::string(kSuffix) + "."))
-            found.push_back(entry.path());
+            found.push_back(file);
     }
     return found;
 }

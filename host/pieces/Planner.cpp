@@ -21,6 +21,7 @@ extern "C" {
 #include <algorithm>
 #include <filesystem>
 #include <fmt/format.h>
+#include <new>
 #include <utility>
 
 namespace movieconv {
@@ -146,8 +147,31 @@ EncodeParam ParamFor(const Request& request, Movie& movie) {
     return param;
 }
 
-std::vector<std::optional<int64_t>> TicksBefore(const EncodeParam& param, Movie& movie,
+/// A set of the writer's options that says what decides, beside the parameters, when pictures are shown.
+class TimeOptions {
+public:
+    explicit TimeOptions(bool steadyRate) {
+        WriterOptions options{};
+        options.bSteadyRate = steadyRate ? 1 : 0;
+        number_ = MWRegisterOptions(&options);
+        if (number_ == 0)
+            throw std::bad_alloc();
+    }
+    TimeOptions(const TimeOptions&) = delete;
+    TimeOptions& operator=(const TimeOptions&) = delete;
+    ~TimeOptions() { MWUnregisterOptions(number_); }
+
+    uint32_t Number() const { return number_; }
+
+private:
+    uint32_t number_ = 0;
+};
+
+std::vector<std::optional<int64_t>> TicksBefore(EncodeParam param, const Request& request, Movie& movie,
                                                 const Stamps& stamps) {
+    const PicturePlan plan = PlanPictures(request, ChooseFormat(request), *movie.Info().pictures);
+    const TimeOptions options(plan.steadyRate);
+    param.nReserved[kWriterSetWord] = options.Number();
     const VideoFormat format = movie.Pictures()->GetVideoInfo()->format;
     std::vector<int64_t> times = stamps.times;
     for (int64_t& time : times)
@@ -220,7 +244,6 @@ Plan BeginPlan(const Request& request, const Division& division) {
         plan.settings.crop = source.pictures->crop;
     plan.settings.detectCrop = false;
     plan.settings.format = ChooseFormat(request).fccFormat;
-    plan.settings.maxSize.reset();
     plan.settings.preview.reset();
     plan.settings.input.clear();
     plan.settings.output.clear();
@@ -249,7 +272,7 @@ std::optional<Plan> MakePlan(Plan plan, const std::function<bool()>& stopped) {
         throw Failure(Category::kRequest, fmt::format("that makes {} pieces; at most {} can be made",
                                                       firsts.size(), kMostPieces));
     const EncodeParam param = ParamFor(request, movie);
-    plan.pictures = PiecesOf(*stamps, firsts, TicksBefore(param, movie, *stamps),
+    plan.pictures = PiecesOf(*stamps, firsts, TicksBefore(param, request, movie, *stamps),
                              PicturesAhead(param, request, movie.Info()));
     return plan;
 }
@@ -271,6 +294,7 @@ Request RequestFor(const Plan& plan, int number, const std::string& output) {
     request.output = output;
     request.overwrite = true; // whatever was left there
     request.keepPartial = false;
+    request.maxSize.reset();    // the rates are chosen for it
     request.encoderThreads = 1; // more of them may change the bytes from run to run
     PieceCut cut;
     cut.pictures = !plan.IsRest(number);

@@ -210,6 +210,7 @@ void Asked(Archive& archive, Fields& request) {
     archive("videoMaxRate", request.videoMaxRate);
     archive("audioRate", request.audioRate);
     archive("audioMaxRate", request.audioMaxRate);
+    archive("maxSize", request.maxSize);
     archive("channels", request.channels);
     archive("sampleRate", request.sampleRate);
     archive("deinterlace", request.deinterlace);
@@ -244,7 +245,6 @@ Json SettingsAsJson(const Request& request) {
 
 Json WishesAsJson(const Request& request) {
     Json json = SettingsAsJson(request);
-    json["maxSize"] = request.maxSize.value_or(0);
     json["noVideo"] = request.noVideo;
     json["detectCrop"] = request.detectCrop;
     return json;
@@ -267,7 +267,8 @@ Json MarksAsJson(const std::vector<SourceMark>& marks) {
 
 std::string DifferenceIn(const Json& before, const Json& now, const std::vector<std::string>& parts) {
     const auto text = [](const Json& json, const std::string& key) {
-        return json.contains(key) ? json.at(key).dump() : std::string("nothing");
+        return json.contains(key) ? json.at(key).dump(-1, ' ', false, Json::error_handler_t::replace)
+                                  : std::string("nothing"); // names are not always UTF-8
     };
     std::string what;
     for (const std::string& part : parts) {

@@ -5,6 +5,7 @@
 #include "text/Path.h"
 #include "text/WriteAll.h"
 
+#include <algorithm>
 #include <array>
 #include <cerrno>
 #include <cstdio>
@@ -91,16 +92,26 @@ std::string NameInTheMaking(const std::string& path) {
 }
 
 std::vector<std::filesystem::path> FilesInTheMaking(const std::string& path) {
-    std::vector<std::filesystem::path> found;
-    const std::string prefix = text::NameOf(path) + std::string(kMaking);
-    std::error_code error;
-    for (const auto& entry : std::filesystem::directory_iterator(text::FolderOf(path), error)) {
-        const std::string name = entry.path().filename().string();
+    const std::string prefix = path + std::string(kMaking);
+    std::vector<std::filesystem::path> found = FilesThatBegin(prefix);
+    const auto isOther = [most = text::NameOf(prefix).size()](const std::filesystem::path& file) {
+        const std::string name = file.filename().string();
         const std::size_t number = name.find_last_not_of("0123456789") + 1;
-        if (name.compare(0, prefix.size(), prefix) == 0 && number > prefix.size() && number < name.size() &&
-            name[number - 1] == '-')
-            found.push_back(entry.path());
-    }
+        return number <= most || number == name.size() || name[number - 1] != '-';
+    };
+    found.erase(std::remove_if(found.begin(), found.end(), isOther), found.end());
+    return found;
+}
+
+std::vector<std::filesystem::path> FilesThatBegin(const std::string& path) {
+    std::vector<std::filesystem::path> found;
+    const std::string prefix = text::NameOf(path);
+    std::error_code error;
+    const std::filesystem::directory_iterator end;
+    for (std::filesystem::directory_iterator file(text::FolderOf(path), error); !error && file != end;
+         file.increment(error))
+        if (file->path().filename().string().compare(0, prefix.size(), prefix) == 0)
+            found.push_back(file->path());
     return found;
 }
 

@@ -29,6 +29,9 @@ std::string NameInTheMaking(const std::string& path);
 /// The files of such names: being made, or left by processes that were killed.
 std::vector<std::filesystem::path> FilesInTheMaking(const std::string& path);
 
+/// All whose paths begin so, as far as the folder can be read.
+std::vector<std::filesystem::path> FilesThatBegin(const std::string& path);
+
 } // namespace movieconv
 
 #endif

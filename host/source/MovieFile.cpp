@@ -32,10 +32,11 @@ std::string CannotOpen(const std::string& path, const std::string& reason) {
     return "cannot open \"" + path + "\": " + reason;
 }
 
+/// For want of memory too: how much is asked for is written in the file.
 std::string ReasonOf(int error) {
-    return error == AVERROR_INVALIDDATA
-               ? "it is not a movie, or its index is missing because it was never finished"
-               : av::ErrorText(error);
+    if (error == AVERROR_INVALIDDATA)
+        return "it is not a movie, or its index is missing because it was never finished";
+    return error == AVERROR(ENOMEM) ? "it asks for more memory than there is" : av::ErrorText(error);
 }
 
 } // namespace
@@ -90,19 +91,16 @@ void MovieFile::Open(const std::string& url, const AVInputFormat& format) {
     context->interrupt_callback = {WasInterrupted, const_cast<Interruption*>(&bytes_.Interrupter())};
     companions_.Guard(*context);
     int result = avformat_open_input(&context, url.c_str(), &format, settings.Get());
-    av::CheckMemory(result);
     input_.reset(context);
-    if (result >= 0) {
+    if (result >= 0)
         result = avformat_find_stream_info(context, nullptr);
-        av::CheckMemory(result);
-    }
     companions_.AllowRepetition();
     if (!companions_.Refusal().empty())
         throw SourceError(CannotOpen(path_, companions_.Refusal()));
     if (result < 0 && context == nullptr)
         throw SourceError(CannotOpen(path_, ReasonOf(result)));
     if (result < 0)
-        throw SourceError("cannot read the streams of \"" + path_ + "\": " + av::ErrorText(result));
+        throw SourceError("cannot read the streams of \"" + path_ + "\": " + ReasonOf(result));
 }
 
 } // namespace movieconv

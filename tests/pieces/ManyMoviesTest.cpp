@@ -80,6 +80,25 @@ TEST(ManyMovies, GoOnWhenOneFailsAndTellTheWorst) {
     EXPECT_TRUE(std::filesystem::exists(movies.out + "/c.mp4"));
 }
 
+// What a movie asks for is no lack of memory that would end everything.
+TEST(ManyMovies, GoOnBehindOneThatAsksForTooMuch) {
+    const Movies movies;
+    const std::string source = movies.folder / "in/a-hostile.mp4";
+    ASSERT_EQ(program::Run({"ffmpeg", "-v", "error", "-f", "lavfi", "-i", "testsrc=s=64x48:d=1", "-c:v",
+                            "mpeg4", source})
+                  .code,
+              0);
+    std::string bytes = ReadFile(source);
+    const std::size_t offsets = bytes.find("stco");
+    ASSERT_NE(offsets, std::string::npos);
+    WriteFile(source, bytes.replace(offsets + 8, 4, std::string("\x20\0\0\0", 4)));
+    const Result alone = Call({"-q", source, movies.folder / "alone.mkv"});
+    EXPECT_EQ(alone.code, 3) << alone.err;
+    const Result result = movies.Convert();
+    EXPECT_TRUE(Has(result.err, "asks for more memory")) << result.err;
+    EXPECT_TRUE(std::filesystem::exists(movies.out + "/c.mp4"));
+}
+
 TEST(ManyMovies, BelieveNoLineOfTheJournalThatWasEdited) {
     const Movies movies;
     ASSERT_EQ(movies.Convert().code, 0);

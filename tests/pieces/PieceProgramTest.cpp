@@ -384,4 +384,22 @@ TEST(Pieces, ResumeOnlyTheSameConversionAndTellWhatDiffers) {
     EXPECT_FALSE(std::filesystem::exists(plan));
 }
 
+TEST(Pieces, AreNoWayAroundALargestSize) {
+    const Folder folder;
+    const Result result = Call({"-q", "--length", "5", "--max-size", "100k", "--pieces", "40", "--jobs", "2",
+                                LongSource(), folder / "out.mp4"});
+    EXPECT_EQ(result.code, kCannotWrite) << result.err;
+    EXPECT_TRUE(Has(result.err, "has become larger than asked for")) << result.err;
+}
+
+TEST(Pieces, TellWhatIsLeftOnceTheyHaveStarted) {
+    const Planned farm;
+    ASSERT_EQ(Call({"-q", "--plan", farm.output + ".plan", "--pieces", "2", Source(), farm.output}).code, 0);
+    const Result result =
+        Call({"--progress", "json", "--jobs", "1", "--pieces", "2", "-y", Source(), farm.output});
+    EXPECT_EQ(result.code, 0);
+    EXPECT_TRUE(Has(result.out, "is left of an earlier run")) << result.out;
+    EXPECT_TRUE(Has(result.out.substr(0, result.out.find('\n')), R"("event":"start")")) << result.out;
+}
+
 } // namespace

@@ -89,6 +89,11 @@ protected:
     /// Writes the movie and gives the last status of the file.
     WriterStatus Run() {
         writer::OptionSet set(kWriterDefaultSet, options_);
+        set.ChangeExtras([this](writer::Extras& extras) {
+            if (withChapter_)
+                extras.chapters.push_back({0, 20'000'000, "One"});
+            return true;
+        });
         events_.clear();
         created_ = false;
         faults_.writes = 0;
@@ -116,6 +121,7 @@ protected:
     WriterOptions options_{};
     std::vector<int> events_;
     bool created_ = false;
+    bool withChapter_ = false;
     int asked_ = 0; ///< For more room.
 };
 
@@ -245,6 +251,23 @@ TEST_F(Fault, SyncAndRenameKeepTheDataUnderItsTemporaryName) {
         EXPECT_FALSE(std::filesystem::exists(path_));
         EXPECT_EQ(folder_.Names().size(), 1U);
         std::filesystem::remove(status.szTemporaryPath);
+    }
+}
+
+// Without it the fragmented file is a whole movie, unless something is in the index alone.
+TEST_F(Fault, NoRoomForTheIndexLosesNothing) {
+    for (const bool withChapter : {false, true}) {
+        withChapter_ = withChapter;
+        faults_.failingWrite = -1;
+        ASSERT_EQ(Run().nState, kWriterFileComplete);
+        std::filesystem::remove(path_);
+        faults_.failingWrite = faults_.writes - 1;
+        const WriterStatus status = Run();
+        EXPECT_EQ(status.nState, withChapter ? kWriterFileFailed : kWriterFileComplete);
+        EXPECT_EQ(status.nError, withChapter ? kWriterErrorNoSpace : kWriterErrorNone);
+        const std::string kept = withChapter ? status.szTemporaryPath : path_;
+        EXPECT_EQ(ReadMovieFile(kept).pictures.size(), 100U);
+        std::filesystem::remove(kept);
     }
 }
 
