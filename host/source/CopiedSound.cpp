@@ -166,9 +166,12 @@ bool CopiedSound::Find(int64_t until, bool closing, Item& item) {
     const auto isBehind = [&](const Held& held) { return TimeOf(held.begin) >= until; };
     while (pending_.empty() || !isBehind(pending_.back())) {
         Demuxer::Beside taken = demuxer_.TakeBeside(stream_, until, closing);
-        if (!taken.packet)
+        if (taken.packet)
+            Hold(std::move(taken.packet));
+        else if (taken.ended && doubted_)
+            SettleDoubted(std::nullopt);
+        else
             break;
-        Hold(std::move(taken.packet));
     }
     if (pending_.empty() || isBehind(pending_.front()) || !Cut(pending_.front(), until, closing)) {
         item.time = pending_.empty() ? until : std::min(until, TimeOf(pending_.front().begin));
@@ -211,7 +214,22 @@ void CopiedSound::Hold(av::Packet packet) {
     av_packet_shrink_side_data(packet.get(), AV_PKT_DATA_NEW_EXTRADATA, 0); // it has been told
     Held held{std::move(packet), 0, 0};
     held.samples = Samples(*held.packet);
-    if (!Place(held))
+    const std::optional<int64_t> stamp = StampOf(held);
+    SettleDoubted(stamp);
+    if (timeline_ && held.samples > 0 && timeline_->NeedsWitness(stamp))
+        doubted_ = std::move(held);
+    else
+        Settle(std::move(held), std::nullopt);
+}
+
+void CopiedSound::SettleDoubted(std::optional<int64_t> witness) {
+    if (std::optional<Held> doubted = std::exchange(doubted_, std::nullopt))
+        Settle(std::move(*doubted), witness);
+}
+
+/// Puts it behind the pending ones, as far as it belongs into the output.
+void CopiedSound::Settle(Held held, std::optional<int64_t> witness) {
+    if (!Place(held, witness))
         return;
     // What is not to be heard is wanted as the run-up only.
     const bool isHeard = (held.packet->flags & AV_PKT_FLAG_DISCARD) == 0;
@@ -231,11 +249,16 @@ void CopiedSound::Hold(av::Packet packet) {
     pending_.push_back(std::move(held));
 }
 
+/// On the timeline, once that has begun.
+std::optional<int64_t> CopiedSound::StampOf(const Held& held) const {
+    if (held.packet->pts == AV_NOPTS_VALUE)
+        return std::nullopt;
+    return reader_.MediaTime(held.packet->pts, timeBase_) - (timeline_ ? TimeOf(origin_) : 0);
+}
+
 /// False when the source has gone back to what it had given before.
-bool CopiedSound::Place(Held& held) {
-    std::optional<int64_t> stamp;
-    if (held.packet->pts != AV_NOPTS_VALUE)
-        stamp = reader_.MediaTime(held.packet->pts, timeBase_);
+bool CopiedSound::Place(Held& held, std::optional<int64_t> witness) {
+    const std::optional<int64_t> stamp = StampOf(held);
     if (!timeline_) {
         origin_ = SamplesAt(stamp.value_or(0));
         const int64_t unit = av_rescale_q_rnd(1, timeBase_, {1, parameters_->sample_rate}, AV_ROUND_UP);
@@ -248,13 +271,11 @@ bool CopiedSound::Place(Held& held) {
     }
     const int64_t before = timeline_->Position();
     if (held.samples == 0) { // of unknown length: the stamp alone tells
-        held.begin = std::max(origin_ + before, SamplesAt(stamp.value_or(0)));
+        held.begin = std::max(origin_ + before, stamp ? SamplesAt(*stamp + TimeOf(origin_)) : 0);
         timeline_->FillTo(TimeOf(held.begin - origin_));
         return true;
     }
-    if (stamp)
-        *stamp -= TimeOf(origin_);
-    const SoundTimeline::Placement placement = timeline_->Place(stamp, held.samples);
+    const SoundTimeline::Placement placement = timeline_->Place(stamp, held.samples, witness);
     held.begin = origin_ + before + placement.silence;
     return placement.cut < held.samples;
 }

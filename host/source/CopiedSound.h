@@ -39,7 +39,10 @@ private:
     bool Find(int64_t until, bool closing, Item& item) override;
     bool Cut(Held& first, int64_t until, bool closing);
     void Hold(av::Packet packet);
-    bool Place(Held& held);
+    void SettleDoubted(std::optional<int64_t> witness);
+    void Settle(Held held, std::optional<int64_t> witness);
+    bool Place(Held& held, std::optional<int64_t> witness);
+    std::optional<int64_t> StampOf(const Held& held) const;
     int64_t RunUp(const AVPacket& first) const;
     int64_t Samples(const AVPacket& packet);
     int64_t SamplesAt(int64_t time) const;
@@ -57,7 +60,8 @@ private:
     };
     std::unique_ptr<AVVorbisParseContext, VorbisParserFree> vorbis_;
     std::optional<SoundTimeline> timeline_;
-    int64_t origin_ = 0; ///< Of the timeline, in samples from the start of the source.
+    int64_t origin_ = 0;          ///< Of the timeline, in samples from the start of the source.
+    std::optional<Held> doubted_; ///< Waits for a witness.
     std::deque<Held> pending_;
     Held current_; ///< Handed out last.
 };

@@ -1,5 +1,7 @@
 #include "host/source/PcmDecoder.h"
 
+#include "host/source/MediaTime.h"
+
 #include <algorithm>
 #include <utility>
 
@@ -50,6 +52,11 @@ bool PcmDecoder::Decode(const AVPacket* packet) {
 }
 
 bool PcmDecoder::FillTo(int64_t time) {
+    if (doubted_ && doubted_->stamp <= time) { // the others have come there, too
+        const int64_t samples = static_cast<int64_t>(doubted_->chunk.size()) / frameBytes_;
+        if (!PushDoubted(doubted_->stamp + av_rescale(samples, kTicksPerSecond, format_.nSampleRate)))
+            return false;
+    }
     const int64_t samples = timeline_->FillTo(time);
     return samples == 0 || sink_.silence(samples);
 }
@@ -104,9 +111,24 @@ PcmDecoder::Chunk PcmDecoder::Resample(const AVFrame* frame) {
     return chunk;
 }
 
-/// Hands out the samples at their place on the timeline. False when nobody takes them any more.
-bool PcmDecoder::PushPlaced(std::optional<int64_t> stamp, const Chunk& chunk) {
-    const auto placement = timeline_->Place(stamp, static_cast<int64_t>(chunk.size()) / frameBytes_);
+/// Hands out the samples at their place on the timeline, once it is known. False when nobody takes them any
+/// more.
+bool PcmDecoder::PushPlaced(std::optional<int64_t> stamp, Chunk chunk) {
+    if (!PushDoubted(stamp))
+        return false;
+    if (!timeline_->NeedsWitness(stamp))
+        return Push(stamp, chunk, std::nullopt);
+    doubted_ = Doubted{*stamp, std::move(chunk)};
+    return true;
+}
+
+bool PcmDecoder::PushDoubted(std::optional<int64_t> witness) {
+    const std::optional<Doubted> doubted = std::exchange(doubted_, std::nullopt);
+    return !doubted || Push(doubted->stamp, doubted->chunk, witness);
+}
+
+bool PcmDecoder::Push(std::optional<int64_t> stamp, const Chunk& chunk, std::optional<int64_t> witness) {
+    const auto placement = timeline_->Place(stamp, static_cast<int64_t>(chunk.size()) / frameBytes_, witness);
     if (placement.silence > 0 && !sink_.silence(placement.silence))
         return false;
     if (placement.cut * frameBytes_ == static_cast<int64_t>(chunk.size()))

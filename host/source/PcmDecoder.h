@@ -51,7 +51,9 @@ private:
     bool Accept(const AVFrame& frame);
     bool FitResampler(const AVFrame& frame);
     Chunk Resample(const AVFrame* frame);
-    bool PushPlaced(std::optional<int64_t> stamp, const Chunk& chunk);
+    bool PushPlaced(std::optional<int64_t> stamp, Chunk chunk);
+    bool PushDoubted(std::optional<int64_t> witness);
+    bool Push(std::optional<int64_t> stamp, const Chunk& chunk, std::optional<int64_t> witness);
 
     const MovieReader& reader_;
     const Sink sink_;
@@ -64,6 +66,11 @@ private:
     av::ChannelLayout outputLayout_;
     av::Frame inputForm_; // format, rate and layout that the resampler is made for
     std::optional<SoundTimeline> timeline_;
+    struct Doubted {
+        int64_t stamp;
+        Chunk chunk;
+    };
+    std::optional<Doubted> doubted_; // waits for a witness
     int64_t damagedBefore_ = 0;
 };
 

@@ -11,11 +11,21 @@ extern "C" {
 
 namespace movieconv {
 
-SoundTimeline::Placement SoundTimeline::Place(std::optional<int64_t> stamp, int64_t samples) {
+int64_t SoundTimeline::OffsetOf(int64_t stamp) const {
+    return av_rescale(stamp - begin_, sampleRate_, kTicksPerSecond) - position_;
+}
+
+bool SoundTimeline::NeedsWitness(std::optional<int64_t> stamp) const {
+    return stamp && position_ > 0 && std::abs(OffsetOf(*stamp)) > sampleRate_;
+}
+
+SoundTimeline::Placement SoundTimeline::Place(std::optional<int64_t> stamp, int64_t samples,
+                                              std::optional<int64_t> witness) {
     Placement placement;
     if (stamp) {
-        const int64_t offset = av_rescale(*stamp - begin_, sampleRate_, kTicksPerSecond) - position_;
-        if (position_ == 0 || IsGap(offset)) {
+        const int64_t offset = OffsetOf(*stamp);
+        const bool witnessed = witness && std::abs(OffsetOf(*witness) - offset - samples) * 2 <= sampleRate_;
+        if (position_ == 0 || IsGap(offset, witnessed)) {
             placement.silence = std::max<int64_t>(offset, 0);
             placement.cut = std::clamp<int64_t>(-offset, 0, samples);
         }
@@ -32,17 +42,12 @@ int64_t SoundTimeline::FillTo(int64_t time) {
 }
 
 /// Whether a frame that lies `offset` samples ahead of the timeline's end really does.
-bool SoundTimeline::IsGap(int64_t offset) {
+bool SoundTimeline::IsGap(int64_t offset, bool witnessed) {
     constexpr int64_t kRoundingParts = 40; // of a second
-    if (std::abs(offset) * kRoundingParts <= sampleRate_) {
-        suspected_.reset();
+    if (std::abs(offset) * kRoundingParts <= sampleRate_ || (std::abs(offset) > sampleRate_ && !witnessed))
         return false;
-    }
-    const bool large = std::abs(offset) > sampleRate_;
-    const bool confirmed = !large || (suspected_ && std::abs(offset - *suspected_) * 2 <= sampleRate_);
-    suspected_ = large ? std::optional(offset) : std::nullopt;
-    corrections_ += confirmed ? 1 : 0;
-    return confirmed;
+    ++corrections_;
+    return true;
 }
 
 } // namespace movieconv

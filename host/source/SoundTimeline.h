@@ -21,8 +21,14 @@ public:
     /// `begin` is the time of sample 0, in media time.
     SoundTimeline(int sampleRate, int64_t begin) : sampleRate_(sampleRate), begin_(begin) {}
 
-    /// Places a frame of so many samples with its stamp in media time, nothing when it has none.
-    Placement Place(std::optional<int64_t> stamp, int64_t samples);
+    /// Whether the frame of that stamp is to be held back until the next one is known: it lies more than a
+    /// second beside the timeline's end, where a single wild stamp would be.
+    bool NeedsWitness(std::optional<int64_t> stamp) const;
+
+    /// Places a frame of so many samples with its stamp in media time, nothing when it has none. `witness`:
+    /// the stamp of the next one, by which a step of more than a second is believed.
+    Placement Place(std::optional<int64_t> stamp, int64_t samples,
+                    std::optional<int64_t> witness = std::nullopt);
 
     /// Samples of silence up to that media time, which it takes for placed. 0 when it is past.
     int64_t FillTo(int64_t time);
@@ -34,12 +40,12 @@ public:
     int Corrections() const { return corrections_; }
 
 private:
-    bool IsGap(int64_t offset);
+    int64_t OffsetOf(int64_t stamp) const;
+    bool IsGap(int64_t offset, bool witnessed);
 
     const int sampleRate_;
     const int64_t begin_;
     int64_t position_ = 0;
-    std::optional<int64_t> suspected_; // the last frame's offset if it was large; the next must confirm it
     int corrections_ = 0;
 };
 

@@ -200,6 +200,18 @@ TEST(Decoders, FillTheTimeBeforeLateSound) {
     EXPECT_NEAR(beeps[1], 2.3, 0.002);
 }
 
+// All of it, from its first packet on.
+TEST(Decoders, KeepSoundBehindAGapInItsPlace) {
+    const std::string path = Make("gap.mkv", Join(CountedPictures(8), Beeps(8), NearLossless(),
+                                                  Args{"-af", "aselect='lt(t,2.6)+gt(t,4.99)'"}));
+    Movie movie(path, {});
+    const std::vector<double> beeps = Beginnings(TakeAll(movie), 44100);
+    ASSERT_EQ(beeps.size(), 6U); // those of seconds 3 and 4 are missing
+    EXPECT_NEAR(beeps[2], 2, 0.03);
+    EXPECT_NEAR(beeps[3], 5, 0.03);
+    EXPECT_NEAR(beeps[5], 7, 0.03);
+}
+
 TEST(Decoders, HoldTheFirstPictureWhenSoundBeginsFirst) {
     const std::string path =
         Make("early.mkv", Join(Args{"-itsoffset", "0.72"}, CountedPictures(2), Beeps(3), NearLossless()));

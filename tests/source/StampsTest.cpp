@@ -98,11 +98,13 @@ TEST(SoundTimeline, FillsGapsAndCutsOverlaps) {
 TEST(SoundTimeline, NeedsASecondWitnessForALargeGap) {
     SoundTimeline timeline(kRate, 0);
     timeline.Place(0, 100);
-    ExpectPlaced(timeline.Place(Ms(900'000), 100), 0, 0);
+    EXPECT_FALSE(timeline.NeedsWitness(Ms(900)));
+    EXPECT_TRUE(timeline.NeedsWitness(Ms(900'000)));
+    ExpectPlaced(timeline.Place(Ms(900'000), 100, Ms(200)), 0, 0);
     ExpectPlaced(timeline.Place(Ms(200), 100), 0, 0);
     EXPECT_EQ(timeline.Position(), 300);
-    ExpectPlaced(timeline.Place(Ms(8300), 100), 0, 0);
-    ExpectPlaced(timeline.Place(Ms(8400), 100), 8000, 0);
+    ExpectPlaced(timeline.Place(Ms(8300), 100, Ms(8400)), 8000, 0);
+    ExpectPlaced(timeline.Place(Ms(8400), 100), 0, 0);
     EXPECT_EQ(timeline.Position(), 8500);
 }
 
