@@ -3,7 +3,7 @@
 #include "host/convert/EncodePlan.h"
 #include "host/convert/Failure.h"
 #include "host/convert/Sources.h"
-#include "host/pieces/CheckedLine.h"
+#include "host/pieces/SettingsText.h"
 
 #include <algorithm>
 #include <filesystem>
@@ -82,7 +82,7 @@ std::string SettingsOf(Request request) {
     Json settings = WishesAsJson(request);
     settings["texts"] = MarksAsJson(texts);
     settings["madeWith"] = CurrentVersions();
-    return AsText(settings);
+    return settings.dump();
 }
 
 /// One movie being converted.

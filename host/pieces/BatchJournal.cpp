@@ -9,6 +9,7 @@
 
 #include <fmt/format.h>
 #include <sstream>
+#include <stdexcept>
 #include <string_view>
 #include <sys/stat.h>
 #include <unistd.h>
@@ -46,16 +47,23 @@ BatchJournal::BatchJournal(const std::string& folder) : path_(folder + "/" + kNa
 
 void BatchJournal::Read(const std::string& text) {
     std::istringstream lines(text);
-    for (std::string line; std::getline(lines, line);) {
-        const std::optional<Json> entry = ObjectOn(line);
-        const auto part = [&entry](const char* name) { return entry->at(name).get<std::string>(); };
-        const auto hasText = [&entry](const char* name) {
-            return entry->contains(name) && entry->at(name).is_string();
-        };
-        if (entry && hasText("output") && hasText("state") && hasText("task") && hasText("result"))
-            entries_[part("output")] = {part("state") == "done", part("task"), part("result")};
-        else if (!line.empty()) // see Note
+    for (std::string line; std::getline(lines, line);)
+        if (!line.empty() && !Enter(ObjectOn(line))) // empty ones: see Note
             ++damaged_;
+}
+
+/// Whether it is of this kind.
+bool BatchJournal::Enter(const std::optional<Json>& line) {
+    try {
+        if (line)
+            entries_[NameFromJson(line->at("output"))] = {line->at("state").get<std::string>() == "done",
+                                                          line->at("task").get<std::string>(),
+                                                          line->at("result").get<std::string>()};
+        return line.has_value();
+    } catch (const Json::exception&) {
+        return false;
+    } catch (const std::invalid_argument&) {
+        return false;
     }
 }
 
@@ -84,7 +92,7 @@ void BatchJournal::NoteDone(const std::string& output, const SourceMark& source,
 void BatchJournal::Note(const std::string& output, const Entry& entry) {
     const std::string name = text::NameOf(output);
     const std::string line = CheckedLine({{"state", entry.done ? "done" : "begun"},
-                                          {"output", name},
+                                          {"output", NameAsJson(name)},
                                           {"task", entry.task},
                                           {"result", entry.result}});
     const std::lock_guard lock(mutex_);

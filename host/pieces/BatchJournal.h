@@ -2,10 +2,12 @@
 #ifndef MOVIECONV_HOST_PIECES_BATCHJOURNAL_H
 #define MOVIECONV_HOST_PIECES_BATCHJOURNAL_H
 
+#include "host/pieces/JsonName.h"
 #include "host/pieces/Plan.h"
 
 #include <map>
 #include <mutex>
+#include <optional>
 #include <string>
 
 namespace movieconv {
@@ -45,6 +47,7 @@ private:
     };
 
     void Read(const std::string& text);
+    bool Enter(const std::optional<Json>& line);
     void Note(const std::string& output, const Entry& entry);
 
     const std::string path_;

@@ -15,13 +15,9 @@ Json ParseFlat(const std::string& text) {
     });
 }
 
-std::string AsText(const Json& json) {
-    return json.dump(-1, ' ', false, Json::error_handler_t::replace);
-}
-
 std::string CheckedLine(Json object) {
-    object["check"] = DigestOf(AsText(object));
-    return AsText(object) + "\n";
+    object["check"] = DigestOf(object.dump());
+    return object.dump() + "\n";
 }
 
 std::optional<Json> ObjectOn(const std::string& line) {

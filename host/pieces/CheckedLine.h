@@ -13,9 +13,6 @@ namespace movieconv {
 /// anything that is written here: who copies or prints such a value may run out of stack.
 Json ParseFlat(const std::string& text);
 
-/// On one line, without its end. What is no UTF-8 is replaced.
-std::string AsText(const Json& json);
-
 /// The line of an object that has no "check", with its end.
 std::string CheckedLine(Json object);
 

@@ -10,6 +10,7 @@
 #include <filesystem>
 #include <fmt/format.h>
 #include <sstream>
+#include <stdexcept>
 #include <unistd.h>
 #include <vector>
 
@@ -122,11 +123,12 @@ std::optional<ClipJournal::Entry> ClipJournal::EntryOn(const std::string& line) 
     const std::optional<Json> json = ObjectOn(line);
     try {
         if (json && json->at("next").get<int>() > 0)
-            return Entry{json->at("clip").get<std::string>(),
+            return Entry{NameFromJson(json->at("clip")),
                          json->at("mark"),
                          {json->at("next").get<int>(), json->at("begin").get<int64_t>()},
                          json->value("opened", "")};
     } catch (const Json::exception&) { // of another kind
+    } catch (const std::invalid_argument&) {
     }
     return std::nullopt;
 }
@@ -149,7 +151,7 @@ void ClipJournal::Begin() {
 }
 
 void ClipJournal::NoteFinished(const std::string& clip, ClipStart next, const std::string& opened) {
-    AppendWhole(path_, CheckedLine({{"clip", text::NameOf(clip)},
+    AppendWhole(path_, CheckedLine({{"clip", NameAsJson(text::NameOf(clip))},
                                     {"mark", MarkOfClip(clip)},
                                     {"next", next.number},
                                     {"begin", next.begin},
@@ -159,8 +161,8 @@ void ClipJournal::NoteFinished(const std::string& clip, ClipStart next, const st
 void ClipJournal::Remove() const {
     unlink(path_.c_str());
     std::error_code ignored;
-    for (const std::filesystem::path& left : FilesInTheMaking(path_))
-        if (!std::filesystem::equivalent(left, request_.input, ignored))
+    for (const std::filesystem::path& left : FilesThatBegin(path_))
+        if (IsInTheMaking(left, path_) && !std::filesystem::equivalent(left, request_.input, ignored))
             std::filesystem::remove(left, ignored);
 }
 

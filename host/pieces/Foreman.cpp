@@ -73,27 +73,33 @@ public:
     void Closed(const ClosedFile& news) override { pictures_ = news.pictures; }
     void LeftBehind(const NotCarried& news) override { foreman_.News().LeftBehind(news); }
     void Conclude(Verdict& verdict) override {
+        const bool done = verdict.outcome == Outcome::kDone;
         const bool lacks = Lacks(verdict);
-        if (verdict.outcome != Outcome::kDone || lacks)
-            unlink(file_.c_str()); // whatever was made is not the piece
-        if (lacks && fromStart_ && verdict.outcome == Outcome::kDone)
+        if (done && !lacks) {
+            verdict.bytes = SealPiece(file_, foreman_.plan_, foreman_.order_.planPath, number_);
+            verdict.position = length_;
+            return;
+        }
+        unlink(file_.c_str()); // whatever was made is not the piece
+        if (lacks && !fromStart_)
+            HandBack(verdict);
+        else if (lacks && done)
             throw Failure(
                 Category::kSource,
                 fmt::format("piece {} has {} pictures, {} were planned: \"{}\" holds others than its "
                             "stamps tell, and can only be converted undivided",
                             number_, pictures_, Planned(), foreman_.plan_.source.path));
-        if (lacks && !fromStart_) {
-            const std::lock_guard lock(foreman_.mutex_);
-            foreman_.lacking_.insert(number_);
-            verdict = Verdict{};
-            verdict.outcome = Outcome::kDone; // and no file: it is made again
-        } else if (verdict.outcome == Outcome::kDone) {
-            verdict.bytes = SealPiece(file_, foreman_.plan_, foreman_.order_.planPath, number_);
-            verdict.position = length_;
-        }
     }
 
 private:
+    /// It is to be made again, from the source's start. So far this is no failure, and no file.
+    void HandBack(Verdict& verdict) {
+        const std::lock_guard lock(foreman_.mutex_);
+        foreman_.lacking_.insert(number_);
+        verdict = Verdict{};
+        verdict.outcome = Outcome::kDone;
+    }
+
     int64_t Planned() const { return foreman_.plan_.pictures[static_cast<std::size_t>(number_)].pictures; }
 
     /// Whether not every planned picture was taken, though the source is not damaged there. That can be
@@ -129,6 +135,8 @@ Verdict Foreman::Perform() {
     plan_ = std::move(*plan);
     CheckAgainst(plan_);
     missing_ = FindMissing();
+    if (Stopped())
+        return verdict_;
     Announce();
     verdict_.outcome = Outcome::kDone;
     WorkOff(missing_.empty() ? 0 : JobsFor());
@@ -195,7 +203,7 @@ std::deque<int> Foreman::FindMissing() const {
     std::deque<int> missing;
     if (!order_.request) // the pieces were made elsewhere
         return missing;
-    for (int number = plan_.Pieces() - 1; number >= 0; --number)
+    for (int number = plan_.Pieces() - 1; number >= 0 && !Stopped(); --number) // each is read whole
         if (!FaultOf(plan_, order_.planPath, number).empty())
             missing.push_back(number);
     std::sort(missing.begin(), missing.end());

@@ -24,11 +24,13 @@
 namespace movieconv {
 namespace {
 
+constexpr double kCheckingShare = 0.3; // of the time that all of it takes
+
 void CheckPieces(const Plan& plan, const std::string& planPath, const std::function<bool(double)>& goesOn) {
     constexpr std::size_t kMostTold = 5;
     std::string faults;
     std::size_t count = 0;
-    for (int number = 0; number < plan.Pieces() && goesOn(0); ++number) {
+    for (int number = 0; number < plan.Pieces() && goesOn(double(number) / plan.Pieces()); ++number) {
         const std::string fault = FaultOf(plan, planPath, number);
         if (!fault.empty() && ++count <= kMostTold)
             faults += (faults.empty() ? "" : "; ") + fault;
@@ -49,58 +51,33 @@ Request JoinRequest(const Plan& plan, bool replace) {
     return request;
 }
 
-} // namespace
-
-Verdict JoinPieces(const Plan& plan, const std::string& planPath, bool replace, Observer& observer,
-                   const std::function<bool(double)>& goesOn) {
-    const Request request = JoinRequest(plan, replace);
-    CheckOutput(request);
-    CheckPieces(plan, planPath, goesOn);
-    Request reading = request;
-    reading.piece.emplace().pictures = false;
-    Movie movie = OpenMovie(reading);
-    Bell bell;
-    WriterWatch watch(request, movie.Info(), bell);
-    FileLedger files(observer);
-    const Engine engine =
-        MakeEngine(request, movie.Info(), movie.Pictures(), movie.Sound(), watch.OptionSet());
-    const Carried carried = CarryOver(movie, request, ChooseFormat(request), watch.OptionSet());
-    for (const NotCarried& left : carried.left)
-        observer.LeftBehind(left);
-    CarryTimecode(movie.Info(), request, ChooseFormat(request), watch.OptionSet(), request.begin);
-
+/// Has the media writer join them. `follow` is asked with the share that is done whether to go on.
+void Join(const Plan& plan, const std::string& planPath, const Request& request, Movie& movie,
+          const Engine& engine, std::function<bool(double)> follow) {
+    std::vector<std::string> paths;
+    for (int number = 0; number < plan.Pieces(); ++number)
+        paths.push_back(PiecePath(planPath, number));
+    std::vector<const char*> names;
+    for (const std::string& path : paths)
+        names.push_back(path.c_str());
+    WriterJoin join{};
+    join.nPieces = plan.Pieces();
+    join.pszPieces = names.data();
+    join.llSourceBegin = plan.pictures.front().begin;
+    join.pContext = &follow;
+    join.pfnGoesOn = [](void* context, double share) {
+        return (*static_cast<std::function<bool(double)>*>(context))(share) ? 1 : 0;
+    };
     EncodeParam param{};
     MCGetEncodeParam(engine.get(), &param);
     const VideoFormat pictures = movie.Pictures()->GetVideoInfo()->format;
     const AudioFormat sound =
         movie.Sound() != nullptr ? movie.Sound()->GetAudioInfo()->format : AudioFormat{};
-    std::vector<std::string> paths;
-    std::vector<const char*> names;
-    paths.reserve(static_cast<std::size_t>(plan.Pieces()));
-    names.reserve(paths.capacity());
-    for (int number = 0; number < plan.Pieces(); ++number)
-        paths.push_back(PiecePath(planPath, number));
-    for (const std::string& path : paths)
-        names.push_back(path.c_str());
-    std::function<bool(double)> follow = [&](double share) {
-        while (const auto news = watch.Take())
-            files.Enter(*news);
-        return goesOn(share);
-    };
-    const auto ask = [](void* context, double share) {
-        return (*static_cast<std::function<bool(double)>*>(context))(share) ? 1 : 0;
-    };
-    WriterJoin join{};
-    join.nPieces = plan.Pieces();
-    join.pszPieces = names.data();
-    join.llSourceBegin = plan.pictures.front().begin;
-    join.pfnGoesOn = ask;
-    join.pContext = &follow;
     MWJoinPieces(text::FromUtf8(request.output).c_str(), &param, &pictures,
                  movie.Sound() != nullptr ? &sound : nullptr, &join);
-    while (const auto news = watch.Take())
-        files.Enter(*news);
+}
 
+Verdict VerdictOn(const Plan& plan, const Request& request, const FileLedger& files) {
     Verdict verdict;
     verdict.failure = files.FirstFailure();
     if (const auto missing = verdict.failure ? std::nullopt : files.FindMissing())
@@ -114,6 +91,37 @@ Verdict JoinPieces(const Plan& plan, const std::string& planPath, bool replace, 
     verdict.bytes = files.Bytes();
     verdict.files = files.Complete();
     return verdict;
+}
+
+} // namespace
+
+Verdict JoinPieces(const Plan& plan, const std::string& planPath, bool replace, Observer& observer,
+                   const std::function<bool(double)>& goesOn) {
+    const Request request = JoinRequest(plan, replace);
+    CheckOutput(request);
+    CheckPieces(plan, planPath, [&](double share) { return goesOn(share * kCheckingShare); });
+    Request reading = request;
+    reading.piece.emplace().pictures = false;
+    Movie movie = OpenMovie(reading);
+    Bell bell;
+    WriterWatch watch(request, movie.Info(), bell);
+    FileLedger files(observer);
+    const Engine engine =
+        MakeEngine(request, movie.Info(), movie.Pictures(), movie.Sound(), watch.OptionSet());
+    const Carried carried = CarryOver(movie, request, ChooseFormat(request), watch.OptionSet());
+    for (const NotCarried& left : carried.left)
+        observer.LeftBehind(left);
+    CarryTimecode(movie.Info(), request, ChooseFormat(request), watch.OptionSet(), request.begin);
+    const auto enterNews = [&] {
+        while (const auto news = watch.Take())
+            files.Enter(*news);
+    };
+    Join(plan, planPath, request, movie, engine, [&](double share) {
+        enterNews();
+        return goesOn(kCheckingShare + share * (1 - kCheckingShare));
+    });
+    enterNews();
+    return VerdictOn(plan, request, files);
 }
 
 } // namespace movieconv

@@ -1,9 +1,10 @@
 #include "host/pieces/PieceFile.h"
 
 #include "host/convert/Failure.h"
-#include "host/pieces/Descriptor.h"
 #include "host/pieces/Digest.h"
 #include "host/pieces/WholeFile.h"
+#include "text/Descriptor.h"
+#include "text/LastingFile.h"
 #include "text/Path.h"
 
 #include <algorithm>
@@ -32,33 +33,40 @@ std::size_t SealSize(const Plan& plan) {
     return Claim(plan, 0, 0).size() + kDigits + 1;
 }
 
-Descriptor OpenForReading(const std::string& path) {
-    return Descriptor(open(path.c_str(), O_RDONLY | O_CLOEXEC));
+text::Descriptor OpenForReading(const std::string& path) {
+    return text::Descriptor(open(path.c_str(), O_RDONLY | O_CLOEXEC));
 }
 
 /// Bytes of an open file; negative when it cannot be told.
-int64_t SizeOf(const Descriptor& file) {
+int64_t SizeOf(const text::Descriptor& file) {
     struct stat status {};
     return file.Number() >= 0 && fstat(file.Number(), &status) == 0 && S_ISREG(status.st_mode)
                ? status.st_size
                : -1;
 }
 
+/// Whether it is a piece of a plan of that name, or is becoming one.
+bool IsPieceName(const std::filesystem::path& file, const std::string& planPath) {
+    const std::string name = file.filename().string();
+    std::string_view rest(name);
+    rest.remove_prefix(std::min(text::NameOf(planPath).size(), rest.size()));
+    if (rest.empty() || rest.front() != '.')
+        return false;
+    rest.remove_prefix(1);
+    const std::size_t digits = std::min(rest.find_first_not_of("0123456789"), rest.size());
+    rest.remove_prefix(digits);
+    return digits >= 4 &&
+           (rest == kSuffix || rest.substr(0, kSuffix.size() + 1) == std::string(kSuffix) + ".");
+}
+
 /// The files that belong to a plan of that name, but for itself.
 std::vector<std::filesystem::path> FilesOf(const std::string& planPath) {
-    std::vector<std::filesystem::path> found = FilesInTheMaking(planPath);
-    const std::string prefix = planPath + ".";
-    for (const std::filesystem::path& file : FilesThatBegin(prefix)) {
-        const std::string name = file.filename().string();
-        std::string_view rest(name);
-        rest.remove_prefix(text::NameOf(prefix).size());
-        const std::size_t digits = std::min(rest.find_first_not_of("0123456789"), rest.size());
-        rest.remove_prefix(digits);
-        if (digits >= 4 &&
-            (rest == kSuffix || rest.substr(0, kSuffix.size() + 1) == std::string(kSuffix) + "."))
-            found.push_back(file);
-    }
-    return found;
+    std::vector<std::filesystem::path> files = FilesThatBegin(planPath);
+    const auto isOther = [&planPath](const std::filesystem::path& file) {
+        return !IsInTheMaking(file, planPath) && !IsPieceName(file, planPath);
+    };
+    files.erase(std::remove_if(files.begin(), files.end(), isOther), files.end());
+    return files;
 }
 
 } // namespace
@@ -78,7 +86,7 @@ int64_t SealPiece(const std::string& file, const Plan& plan, const std::string& 
         std::string seal;
         int64_t bytes = 0;
         {
-            const Descriptor made = OpenForReading(file);
+            const text::Descriptor made = OpenForReading(file);
             bytes = SizeOf(made);
             seal = Claim(plan, number, bytes);
             Digest digest;
@@ -89,7 +97,7 @@ int64_t SealPiece(const std::string& file, const Plan& plan, const std::string& 
             seal += digest.Hex() + "\n";
         }
         AppendWhole(file, seal);
-        if (!RenameLastingly(file, name))
+        if (!text::RenameLastingly(file, name))
             throw Failure(Category::kOutput,
                           fmt::format("\"{}\" cannot get its name: {}", name, std::strerror(errno)));
         return bytes + static_cast<int64_t>(seal.size());
@@ -104,7 +112,7 @@ std::string FaultOf(const Plan& plan, const std::string& planPath, int number) {
     const auto fault = [&](const char* what) {
         return fmt::format("piece {} (\"{}\") {}", number, path, what);
     };
-    const Descriptor file = OpenForReading(path);
+    const text::Descriptor file = OpenForReading(path);
     if (file.Number() < 0)
         return fault(errno == ENOENT ? "is missing" : "cannot be opened");
     const auto sealSize = static_cast<int64_t>(SealSize(plan));

@@ -45,7 +45,7 @@ Json AsJson(const Plan& plan) {
     json["madeWith"] = plan.versions;
     json["source"] = MarkAsJson(plan.source);
     json["texts"] = MarksAsJson(plan.texts);
-    json["output"] = plan.output;
+    json["output"] = NameAsJson(plan.output);
     json["settings"] = SettingsAsJson(plan.settings);
     json["division"] = AsJson(plan.division);
     json["readFromStart"] = plan.fromStart;
@@ -64,16 +64,7 @@ Json AsJson(const Plan& plan) {
 }
 
 std::string HashOf(const Json& json) {
-    return DigestOf(AsText(json));
-}
-
-/// Names are bytes; JSON takes UTF-8 only.
-bool IsUtf8(const std::string& text) {
-    try {
-        return !Json(text).dump().empty();
-    } catch (const Json::exception&) {
-        return false;
-    }
+    return DigestOf(json.dump());
 }
 
 [[noreturn]] void RefusePlan(const std::string& why) {
@@ -89,7 +80,7 @@ int64_t Natural(const Json& json, const char* name) {
 
 /// A path that names one place, without going back on its way.
 std::string Path(const Json& json) {
-    auto text = json.get<std::string>();
+    std::string text = NameFromJson(json);
     const std::filesystem::path path(text);
     if (!path.is_absolute() || path.lexically_normal() != path || text.find('\0') != std::string::npos)
         RefusePlan(fmt::format("\"{}\" is not an absolute path without detours", text));
@@ -178,13 +169,6 @@ Plan ReadPlan(const std::string& path) {
 }
 
 void WritePlan(const std::string& path, Plan& plan) {
-    std::vector<std::string> names{plan.source.path, plan.output};
-    for (const SourceMark& text : plan.texts)
-        names.push_back(text.path);
-    for (const std::string& name : names)
-        if (!IsUtf8(name))
-            throw Failure(Category::kRequest,
-                          fmt::format("\"{}\" cannot stand in a plan: its name is not UTF-8", name));
     Json json = AsJson(plan);
     plan.hash = HashOf(json);
     json["hash"] = plan.hash;

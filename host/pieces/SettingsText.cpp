@@ -35,9 +35,11 @@ Json ToJson(const Value& value) {
     else if constexpr (std::is_same_v<Value, Crop>)
         return Json::array({value.top, value.bottom, value.left, value.right});
     else if constexpr (std::is_same_v<Value, Tag>)
-        return Json::array({value.key, value.value});
+        return Json::array({NameAsJson(value.key), NameAsJson(value.value)});
     else if constexpr (std::is_same_v<Value, SubtitleFileWish>)
-        return Json::array({value.path, value.language});
+        return Json::array({NameAsJson(value.path), NameAsJson(value.language)});
+    else if constexpr (std::is_same_v<Value, std::string>) // may name a file
+        return NameAsJson(value);
     else
         return value;
 }
@@ -81,7 +83,9 @@ void FromJson(const Json& json, Value& value) {
         value.left = json.at(2).get<int>();
         value.right = json.at(3).get<int>();
     } else if constexpr (std::is_same_v<Value, Tag> || std::is_same_v<Value, SubtitleFileWish>) {
-        value = {json.at(0).get<std::string>(), json.at(1).get<std::string>()};
+        value = {NameFromJson(json.at(0)), NameFromJson(json.at(1))};
+    } else if constexpr (std::is_same_v<Value, std::string>) {
+        value = NameFromJson(json);
     } else if constexpr (std::is_same_v<Value, bool>) {
         value = json.get<bool>();
     } else if constexpr (std::is_integral_v<Value>) {
@@ -251,7 +255,7 @@ Json WishesAsJson(const Request& request) {
 }
 
 Json MarkAsJson(const SourceMark& source) {
-    return {{"path", source.path},
+    return {{"path", NameAsJson(source.path)},
             {"bytes", source.bytes},
             {"modified", source.modified},
             {"headSha256", source.head},
@@ -267,8 +271,7 @@ Json MarksAsJson(const std::vector<SourceMark>& marks) {
 
 std::string DifferenceIn(const Json& before, const Json& now, const std::vector<std::string>& parts) {
     const auto text = [](const Json& json, const std::string& key) {
-        return json.contains(key) ? json.at(key).dump(-1, ' ', false, Json::error_handler_t::replace)
-                                  : std::string("nothing"); // names are not always UTF-8
+        return json.contains(key) ? json.at(key).dump() : std::string("nothing");
     };
     std::string what;
     for (const std::string& part : parts) {

@@ -3,15 +3,13 @@
 #define MOVIECONV_HOST_PIECES_SETTINGSTEXT_H
 
 #include "host/convert/Request.h"
+#include "host/pieces/JsonName.h"
 #include "host/pieces/Plan.h"
 
-#include <nlohmann/json.hpp>
 #include <string>
 #include <vector>
 
 namespace movieconv {
-
-using Json = nlohmann::ordered_json;
 
 /// Everything that decides what is in the output, but for the names.
 Json SettingsAsJson(const Request& request);

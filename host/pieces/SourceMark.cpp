@@ -1,9 +1,9 @@
 #include "host/pieces/Plan.h"
 
 #include "host/convert/Failure.h"
-#include "host/pieces/Descriptor.h"
 #include "host/pieces/Digest.h"
 #include "host/source/BurnWish.h"
+#include "text/Descriptor.h"
 
 #include <algorithm>
 #include <cerrno>
@@ -48,7 +48,7 @@ void CheckUnchanged(const SourceMark& planned, const char* kind) {
 } // namespace
 
 SourceMark MarkOf(const std::string& path) {
-    const Descriptor file(open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK));
+    const text::Descriptor file(open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK));
     struct stat status {};
     if (file.Number() < 0 || fstat(file.Number(), &status) != 0)
         throw CannotRead(path, std::strerror(errno));

@@ -1,14 +1,13 @@
 #include "host/pieces/WholeFile.h"
 
 #include "host/convert/Failure.h"
-#include "host/pieces/Descriptor.h"
+#include "text/Descriptor.h"
+#include "text/LastingFile.h"
 #include "text/Path.h"
 #include "text/WriteAll.h"
 
-#include <algorithm>
 #include <array>
 #include <cerrno>
-#include <cstdio>
 #include <cstring>
 #include <fcntl.h>
 #include <fmt/format.h>
@@ -32,7 +31,7 @@ std::string ReadWhole(const std::string& path, int64_t most) {
     const auto refuse = [&](const std::string& why) {
         return Failure(Category::kSource, fmt::format("cannot read \"{}\": {}", path, why));
     };
-    const Descriptor file(open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK));
+    const text::Descriptor file(open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK));
     struct stat status {};
     if (file.Number() < 0 || fstat(file.Number(), &status) != 0)
         throw refuse(std::strerror(errno));
@@ -55,34 +54,16 @@ std::string ReadWhole(const std::string& path, int64_t most) {
 }
 
 void WriteWhole(const std::string& path, std::string_view text) {
-    const std::string making = NameInTheMaking(path);
-    unlink(making.c_str()); // of a process that had the same number, or a link that somebody laid there
-    Descriptor file(open(making.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, 0666));
-    const bool written = file.Number() >= 0 && text::WriteAll(file.Number(), text) &&
-                         fsync(file.Number()) == 0 && file.Close() && RenameLastingly(making, path);
-    if (written)
-        return;
-    const int error = errno;
-    unlink(making.c_str());
-    errno = error;
-    throw CannotWrite(path);
+    if (!text::ReplaceLastingly(path, NameInTheMaking(path), text, 0666))
+        throw CannotWrite(path);
 }
 
 void AppendWhole(const std::string& path, std::string_view text) {
-    Descriptor file(
+    text::Descriptor file(
         open(path.c_str(), O_WRONLY | O_CREAT | O_APPEND | O_NOFOLLOW | O_NONBLOCK | O_CLOEXEC, 0666));
     if (file.Number() < 0 || !text::WriteAll(file.Number(), text) || fsync(file.Number()) != 0 ||
         !file.Close())
         throw CannotWrite(path);
-}
-
-bool RenameLastingly(const std::string& from, const std::string& to) {
-    if (std::rename(from.c_str(), to.c_str()) != 0)
-        return false;
-    const Descriptor folder(open(text::FolderOf(to).c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC));
-    if (folder.Number() >= 0)
-        fsync(folder.Number()); // some file systems cannot; the name is there all the same
-    return true;
 }
 
 std::string NameInTheMaking(const std::string& path) {
@@ -91,16 +72,12 @@ std::string NameInTheMaking(const std::string& path) {
     return fmt::format("{}{}{}-{}", path, kMaking, host.data(), getpid());
 }
 
-std::vector<std::filesystem::path> FilesInTheMaking(const std::string& path) {
-    const std::string prefix = path + std::string(kMaking);
-    std::vector<std::filesystem::path> found = FilesThatBegin(prefix);
-    const auto isOther = [most = text::NameOf(prefix).size()](const std::filesystem::path& file) {
-        const std::string name = file.filename().string();
-        const std::size_t number = name.find_last_not_of("0123456789") + 1;
-        return number <= most || number == name.size() || name[number - 1] != '-';
-    };
-    found.erase(std::remove_if(found.begin(), found.end(), isOther), found.end());
-    return found;
+bool IsInTheMaking(const std::filesystem::path& file, const std::string& path) {
+    const std::string prefix = text::NameOf(path) + std::string(kMaking);
+    const std::string name = file.filename().string();
+    const std::size_t number = name.find_last_not_of("0123456789") + 1;
+    return name.compare(0, prefix.size(), prefix) == 0 && number > prefix.size() && number < name.size() &&
+           name[number - 1] == '-';
 }
 
 std::vector<std::filesystem::path> FilesThatBegin(const std::string& path) {

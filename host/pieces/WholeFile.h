@@ -20,14 +20,11 @@ void WriteWhole(const std::string& path, std::string_view text);
 /// also for a symbolic link and what is no file.
 void AppendWhole(const std::string& path, std::string_view text);
 
-/// Gives a synced file its name, lastingly. False, with errno set, when it fails.
-bool RenameLastingly(const std::string& from, const std::string& to);
-
 /// A name beside `path` that no other process on any machine takes for the same purpose.
 std::string NameInTheMaking(const std::string& path);
 
-/// The files of such names: being made, or left by processes that were killed.
-std::vector<std::filesystem::path> FilesInTheMaking(const std::string& path);
+/// Whether the file has such a name: it is being made, or was left by a process that was killed.
+bool IsInTheMaking(const std::filesystem::path& file, const std::string& path);
 
 /// All whose paths begin so, as far as the folder can be read.
 std::vector<std::filesystem::path> FilesThatBegin(const std::string& path);

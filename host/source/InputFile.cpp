@@ -20,6 +20,8 @@ constexpr int kBufferBytes = 64 * 1024;
 
 InputFile::InputFile(const std::string& path, Growth growth, std::shared_ptr<const Interruption> interruption)
     : file_(open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK)), interruption_(std::move(interruption)) {
+    if (file_.Number() < 0)
+        throw std::system_error(errno, std::generic_category());
     struct stat status {};
     const bool regular = fstat(file_.Number(), &status) == 0 && S_ISREG(status.st_mode);
     size_ = regular ? status.st_size : 0;
@@ -32,15 +34,6 @@ InputFile::InputFile(const std::string& path, Growth growth, std::shared_ptr<con
         return static_cast<InputFile*>(self)->Seek(offset, whence);
     };
     io_ = av::NewIo(kBufferBytes, false, this, read, nullptr, regular ? +seek : nullptr);
-}
-
-InputFile::Descriptor::Descriptor(int number) : number_(number) {
-    if (number_ < 0)
-        throw std::system_error(errno, std::generic_category());
-}
-
-InputFile::Descriptor::~Descriptor() {
-    close(number_);
 }
 
 int InputFile::Read(uint8_t* data, int size) {

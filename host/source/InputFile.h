@@ -4,6 +4,7 @@
 
 #include "ffmpeg/AvHandles.h"
 #include "host/source/Interruption.h"
+#include "text/Descriptor.h"
 
 #include <cstddef>
 #include <cstdint>
@@ -37,23 +38,10 @@ public:
     const Interruption& Interrupter() const { return *interruption_; }
 
 private:
-    class Descriptor {
-    public:
-        /// Throws std::system_error when `number` is that of a failed call.
-        explicit Descriptor(int number);
-        ~Descriptor();
-        Descriptor(const Descriptor&) = delete;
-        Descriptor& operator=(const Descriptor&) = delete;
-        int Number() const { return number_; }
-
-    private:
-        const int number_;
-    };
-
     int Read(uint8_t* data, int size);
     int64_t Seek(int64_t offset, int whence);
 
-    const Descriptor file_;
+    const text::Descriptor file_;
     const std::shared_ptr<const Interruption> interruption_;
     int64_t size_ = 0;
     int64_t end_ = INT64_MAX; // where reading ends at the latest

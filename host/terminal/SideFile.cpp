@@ -1,6 +1,7 @@
 #include "host/terminal/SideFile.h"
 
 #include "host/convert/Failure.h"
+#include "text/Descriptor.h"
 
 #include <cerrno>
 #include <cstdio>
@@ -62,12 +63,11 @@ SideFile LookAtSideFile(const std::string& path, std::string_view mark, off_t of
         return {SideFile::Kind::kLink, {}};
     if (!S_ISREG(status.st_mode)) // opening a device may already do something to it
         return {SideFile::Kind::kNoFile, {}};
-    const int descriptor = open(path.c_str(), O_RDONLY | O_NOFOLLOW | O_NONBLOCK | O_NOCTTY | O_CLOEXEC);
-    if (descriptor < 0)
+    const text::Descriptor file(
+        open(path.c_str(), O_RDONLY | O_NOFOLLOW | O_NONBLOCK | O_NOCTTY | O_CLOEXEC));
+    if (file.Number() < 0)
         throw std::system_error(errno, std::generic_category());
-    const SideFile file = LookAtSideFile(descriptor, mark, offset);
-    close(descriptor);
-    return file;
+    return LookAtSideFile(file.Number(), mark, offset);
 }
 
 void RequireWritable(const SideFile& file, const char* option, const std::string& path, const char* what,

@@ -32,8 +32,9 @@ std::string ClipSource() {
 
 /// A conversion of it that was killed when it had finished two clips or more.
 struct Killed {
+    static constexpr char kOutput[] = "\xE9t\xE9.mp4"; ///< Names of files are bytes; this one is no UTF-8.
     Folder folder;
-    std::string output = folder / "out.mp4";
+    std::string output = folder / kOutput;
     std::string list = output + ".clips";
     Args options{"--progress", "json", "--split", "2"};
 
@@ -58,7 +59,7 @@ struct Killed {
     Result Resume(const Args& more = {}) const {
         return Call(Join(options, Args{"--resume"}, more, Args{ClipSource(), output}));
     }
-    std::string Clip(int number) const { return folder / fmt::format("out_{:02}.mp4", number); }
+    std::string Clip(int number) const { return folder / fmt::format("\xE9t\xE9_{:02}.mp4", number); }
 };
 
 /// All packets with their times; what decoded sound holds depends on where decoding began.
@@ -75,7 +76,7 @@ std::string Told(int clips) {
 
 TEST(ClipsLeft, AreGoneOnWithAtTheFirstOneMissing) {
     const Folder calm;
-    ASSERT_EQ(Call({"-q", "--split", "2", ClipSource(), calm / "out.mp4"}).code, 0);
+    ASSERT_EQ(Call({"-q", "--split", "2", ClipSource(), calm / Killed::kOutput}).code, 0);
     EXPECT_EQ(calm.Names().size(), 10U);
     const Killed killed;
     const auto before = std::filesystem::last_write_time(killed.Clip(1));
@@ -98,7 +99,7 @@ TEST(ClipsLeft, AreNotUsedForAnotherConversionOrWithoutBeingAskedFor) {
     const Args anew = Join(killed.options, Args{ClipSource(), killed.output});
     const Result refused = Call(anew);
     EXPECT_EQ(refused.code, kCannotWrite);
-    EXPECT_TRUE(Has(refused.err, "out.mp4.clips")) << refused.err;
+    EXPECT_TRUE(Has(refused.err, R"(\xe9t\xe9.mp4.clips)")) << refused.err;
     WriteFile(killed.Clip(0), "precious");
     const Result changed = killed.Resume();
     EXPECT_EQ(changed.code, kCannotWrite);
@@ -131,7 +132,7 @@ TEST(ClipsLeft, LeaveWhatIsNoneOfThem) {
     WriteFile(killed.Clip(8), "precious");
     const Result refused = killed.Resume();
     EXPECT_EQ(refused.code, kCannotWrite);
-    EXPECT_TRUE(Has(refused.err, "out_08.mp4\" exists")) << refused.err;
+    EXPECT_TRUE(Has(refused.err, R"(\xe9t\xe9_08.mp4" exists)")) << refused.err;
     EXPECT_EQ(ReadFile(killed.Clip(8)), "precious");
     std::filesystem::remove(killed.Clip(8));
     EXPECT_EQ(killed.Resume().code, 0);

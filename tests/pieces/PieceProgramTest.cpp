@@ -35,9 +35,10 @@ std::string Source() {
 
 /// A plan of four pieces and the sound.
 struct Planned {
+    static constexpr char kOutput[] = "\xE9t\xE9.mp4"; ///< Names of files are bytes; this one is no UTF-8.
     Folder folder;
     std::string plan = folder / "movie.plan";
-    std::string output = folder / "out.mp4";
+    std::string output = folder / kOutput;
 
     Planned() {
         const Result planned = Call({"--plan", plan, "--pieces", "4", Source(), output});
@@ -67,7 +68,7 @@ TEST(Pieces, GiveTheSameBytesInAnyOrderAndInOneProcess) {
     const std::string bytes = ReadFile(farm.output);
     std::filesystem::remove(farm.output);
     ASSERT_EQ(farm.Join().code, 0);
-    EXPECT_EQ(farm.folder.Names(), (std::vector<std::string>{"movie.plan", "out.mp4"}));
+    EXPECT_EQ(farm.folder.Names(), (std::vector<std::string>{"movie.plan", Planned::kOutput}));
     EXPECT_EQ(ReadFile(farm.output), bytes);
 
     const std::string whole = farm.folder / "whole.mp4";
@@ -77,7 +78,7 @@ TEST(Pieces, GiveTheSameBytesInAnyOrderAndInOneProcess) {
         ASSERT_EQ(Call({"-q", "-y", "--jobs", jobs, "--pieces", "4", Source(), whole}).code, 0);
         EXPECT_EQ(ReadFile(whole), bytes) << jobs << " pieces at once";
     }
-    EXPECT_EQ(farm.folder.Names(), (std::vector<std::string>{"movie.plan", "out.mp4", "whole.mp4"}));
+    EXPECT_EQ(farm.folder.Names(), (std::vector<std::string>{"movie.plan", "whole.mp4", Planned::kOutput}));
 }
 
 TEST(Pieces, ThatDoNotBelongTogetherAreRefusedByTheirNames) {
@@ -192,7 +193,8 @@ TEST(Pieces, TellWhenThePlanOrTheSourceWasChanged) {
     refuses(plan.substr(0, plan.size() / 2), "only a part");
     refuses(with("\"pictures\": 50", "\"pictures\": 51"), "was changed");
     refuses(with("\"pictures\": 50", "\"pictures\": -1"), "not a number");
-    refuses(with("\"output\": \"", "\"output\": \"/tmp/.."), "absolute path");
+    refuses(with("\"hex\": \"", "\"hex\": \"2e2e"), "absolute path");
+    refuses(with("\"hex\": \"", "\"hex\": \"2"), "no name in hexadecimal");
     refuses(with("\"path\": \"/", "\"path\": \""), "absolute path");
     refuses(with("\"version\": 1", "\"version\": 2"), "version 2");
     std::string tooMany;

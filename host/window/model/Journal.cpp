@@ -1,7 +1,6 @@
 #include "host/window/model/Journal.h"
 
-#include "text/Path.h"
-#include "text/WriteAll.h"
+#include "text/LastingFile.h"
 
 #include <QCoreApplication>
 #include <QDir>
@@ -22,33 +21,11 @@ namespace {
 
 constexpr int kVersion = 1;
 
-struct Descriptor {
-    explicit Descriptor(int number) : number(number) {}
-    Descriptor(const Descriptor&) = delete;
-    Descriptor& operator=(const Descriptor&) = delete;
-    ~Descriptor() {
-        if (number >= 0)
-            close(number);
-    }
-    int number;
-};
-
-/// Replaces the file so that after a power cut it is the old one or the new one. False with errno set.
-bool Replace(const std::string& path, const QByteArray& bytes) {
-    const std::string temporary = path + ".new";
-    {
-        const Descriptor file(open(temporary.c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0600));
-        if (file.number < 0 ||
-            !text::WriteAll(file.number, {bytes.data(), static_cast<size_t>(bytes.size())}) ||
-            fsync(file.number) != 0)
-            return false;
-    }
-    if (std::rename(temporary.c_str(), path.c_str()) != 0)
-        return false;
-    const Descriptor folder(open(text::FolderOf(path).c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC));
-    if (folder.number >= 0)
-        fsync(folder.number); // some file systems cannot; the queue is there all the same
-    return true;
+/// False with errno set.
+bool Save(const std::string& path, const QByteArray& bytes) {
+    constexpr mode_t kForTheOwner = 0600;
+    return text::ReplaceLastingly(path, path + ".new", {bytes.data(), static_cast<size_t>(bytes.size())},
+                                  kForTheOwner);
 }
 
 /// Where the file is afterwards: under a name of its own, or where it was.
@@ -159,7 +136,7 @@ void Journal::Run() {
 }
 
 void Journal::WriteAndTell(const std::vector<Entry>& entries) {
-    const bool failed = !Replace(path_, Serialise(entries));
+    const bool failed = !Save(path_, Serialise(entries));
     if (failed && !failing_ && failed_) {
         failed_(QCoreApplication::translate(
                     "Journal", "The queue cannot be saved in %1: %2. It will be lost when the program ends.")

@@ -1,10 +1,10 @@
 // A file descriptor that is closed.
-#ifndef MOVIECONV_HOST_PIECES_DESCRIPTOR_H
-#define MOVIECONV_HOST_PIECES_DESCRIPTOR_H
+#ifndef MOVIECONV_TEXT_DESCRIPTOR_H
+#define MOVIECONV_TEXT_DESCRIPTOR_H
 
 #include <unistd.h>
 
-namespace movieconv {
+namespace text {
 
 /// Closes it in the end, unless that was done. That of a failed open stays negative.
 class Descriptor {
@@ -26,6 +26,6 @@ private:
     int number_;
 };
 
-} // namespace movieconv
+} // namespace text
 
 #endif
