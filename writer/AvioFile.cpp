@@ -12,8 +12,8 @@ constexpr int kBufferSize = 128 * 1024;
 
 } // namespace
 
-AvioFile::AvioFile(std::shared_ptr<ByteFile> file, Mode mode, FullDiskHandler onFull, Tap tap)
-    : file_(std::move(file)), onFull_(std::move(onFull)), tap_(std::move(tap)) {
+AvioFile::AvioFile(std::shared_ptr<ByteFile> file, Mode mode, Tap tap)
+    : file_(std::move(file)), tap_(std::move(tap)) {
     io_ = av::NewIo(
         kBufferSize, mode == Mode::kWrite, this,
         [](void* self, uint8_t* data, int size) { return static_cast<AvioFile*>(self)->Read(data, size); },
@@ -44,9 +44,8 @@ int AvioFile::Write(const uint8_t* data, int size) {
             position_ += written;
             size_.store(std::max(size_.load(std::memory_order_relaxed), position_),
                         std::memory_order_relaxed);
-        } else if (const int error = written < 0 ? static_cast<int>(-written) : EIO;
-                   (error != ENOSPC && error != EDQUOT) || !onFull_ || !onFull_(size - done)) {
-            error_ = error;
+        } else {
+            error_ = written < 0 ? static_cast<int>(-written) : EIO;
         }
     }
     return error_ == 0 ? size : AVERROR(error_);

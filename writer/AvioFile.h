@@ -15,16 +15,13 @@ namespace writer {
 /// Works from the start of the file on. The first failure stays: nothing is written after it.
 class AvioFile {
 public:
-    /// Asked when the disk is full, with the bytes that it has not taken; true: try again.
-    using FullDiskHandler = std::function<bool(int64_t)>;
-
     /// Told what was written, and where; 0, or an errno value.
     using Tap = std::function<int(int64_t position, const uint8_t* data, int64_t size)>;
 
     enum class Mode { kRead, kWrite };
 
     /// Throws std::bad_alloc.
-    AvioFile(std::shared_ptr<ByteFile> file, Mode mode, FullDiskHandler onFull = {}, Tap tap = {});
+    AvioFile(std::shared_ptr<ByteFile> file, Mode mode, Tap tap = {});
     AvioFile(const AvioFile&) = delete;
     AvioFile& operator=(const AvioFile&) = delete;
     ~AvioFile() = default;
@@ -47,7 +44,6 @@ private:
     int64_t Seek(int64_t offset, int whence);
 
     const std::shared_ptr<ByteFile> file_;
-    const FullDiskHandler onFull_;
     const Tap tap_;
     av::Io io_;
     int error_ = 0;

@@ -3,6 +3,7 @@
 #include "text/Path.h"
 #include "writer/Fragments.h"
 #include "writer/Muxer.h"
+#include "writer/PatientFile.h"
 #include "writer/PieceFile.h"
 #include "writer/WriterFailure.h"
 #include "writer/WriterStatus.h"
@@ -32,6 +33,8 @@ PartFile::PartFile(const std::string& target, const FilePlan& plan, std::shared_
         throw SystemFailure(kWriterErrorOpen, error, "No file can be created in the folder \"%s\"",
                             text::FolderOf(target).c_str());
     try {
+        file = std::make_unique<PatientFile>(
+            std::move(file), [this](int64_t waiting) { return record_->AskAboutFullDisk(waiting); });
         AvioFile::Tap tap;
         if (plan.Fragmented()) {
             room_.emplace(RoomFor(plan.indexSize + Mp4Index::MostOf(*record_->ExtraParts())));
@@ -40,9 +43,7 @@ PartFile::PartFile(const std::string& target, const FilePlan& plan, std::shared_
                 return room_->Close(*made);
             };
         }
-        io_ = std::make_unique<AvioFile>(
-            std::move(file), AvioFile::Mode::kWrite,
-            [this](int64_t waiting) { return record_->AskAboutFullDisk(waiting); }, std::move(tap));
+        io_ = std::make_unique<AvioFile>(std::move(file), AvioFile::Mode::kWrite, std::move(tap));
         if (plan.piece != kWriterPieceNone)
             packets_ = std::make_unique<PieceWriter>(*io_, *record_);
         else

@@ -280,8 +280,12 @@ TEST_F(Fault, APartialFileIsRemovedWhenTheHostWantsThat) {
     EXPECT_TRUE(folder_.Names().empty());
 }
 
+// Also for the index, which comes last.
 TEST_F(Fault, AFullDiskCanBeWaitedFor) {
-    faults_.failingWrite = 3;
+    options_.bBitExact = 1;
+    ASSERT_EQ(Run().nState, kWriterFileComplete);
+    const std::string undisturbed = ReadFile(path_);
+    const int writes = faults_.writes;
     options_.pfnFullDisk = [](void* context, const WriterStatus* status) {
         auto* self = static_cast<Fault_AFullDiskCanBeWaitedFor_Test*>(context);
         EXPECT_NE(std::string(status->szTemporaryPath), "");
@@ -289,9 +293,14 @@ TEST_F(Fault, AFullDiskCanBeWaitedFor) {
             self->faults_.failingWrite = -1; // There is room again.
         return 1;
     };
-    EXPECT_EQ(Run().nState, kWriterFileComplete);
-    EXPECT_EQ(asked_, 3);
-    EXPECT_EQ(ReadMovieFile(path_).pictures.size(), 100U);
+    for (const int failing : {3, writes - 3, writes - 1}) {
+        SCOPED_TRACE(failing);
+        asked_ = 0;
+        faults_.failingWrite = failing;
+        EXPECT_EQ(Run().nState, kWriterFileComplete);
+        EXPECT_EQ(asked_, 3);
+        EXPECT_EQ(ReadFile(path_), undisturbed);
+    }
 }
 
 TEST_F(Fault, NeitherFilesNorThreadsAreLeftBehind) {
