@@ -155,6 +155,10 @@ bool BelongTogether(const StreamInfo& one, const StreamInfo& other) {
            });
 }
 
+bool CanBeHeard(const StreamInfo& stream) {
+    return stream.decodable && stream.sound && stream.sound->sampleRate > 0 && stream.sound->channels > 0;
+}
+
 /// Why a stream of sound beside the engine's stays behind; empty when it does not.
 std::string WhySoundStays(const SourceInfo& source, const StreamInfo& stream, const FileFormatInfo& format,
                           bool copies) {
@@ -162,7 +166,7 @@ std::string WhySoundStays(const SourceInfo& source, const StreamInfo& stream, co
         return fmt::format("{} cannot hold it", ShortName(format));
     if (!HoldsSeveralTracks(format))
         return fmt::format("{} holds one track of sound, MKV and MP4 hold several", ShortName(format));
-    if (!stream.decodable || !stream.sound || stream.sound->sampleRate <= 0 || stream.sound->channels <= 0)
+    if (!CanBeHeard(stream))
         return "it cannot be decoded";
     if (copies && MWCarriesPackets(format.fccFormat, stream.codec.c_str()) == 0)
         return fmt::format("{} cannot hold it as it is", ShortName(format));
@@ -205,8 +209,12 @@ struct Chosen {
     std::vector<int> sounds; ///< Wanted ones.
     std::vector<int> subtitles;
 
+    bool noPictures = false; ///< The user wants none.
+    bool noSound = false;
+
     bool Wants(const StreamInfo& stream) const {
-        return stream.kind == StreamKind::kSound       ? IsAmong(sounds, stream.index)
+        return stream.kind == StreamKind::kPictures    ? !noPictures
+               : stream.kind == StreamKind::kSound     ? !noSound && IsAmong(sounds, stream.index)
                : stream.kind == StreamKind::kSubtitles ? IsAmong(subtitles, stream.index)
                                                        : true;
     }
@@ -218,10 +226,11 @@ std::string WhyItStays(const SourceInfo& source, const Chosen& chosen, const Str
     const uint32_t traits = MWGetFormatTraits(format.fccFormat);
     switch (stream.kind) {
     case StreamKind::kPictures:
-        return chosen.pictures < 0 || chosen.pictures == stream.index ? ""
-                                                                      : "one stream of pictures is converted";
+        if (chosen.pictures == stream.index || format.bHasVideo == 0)
+            return {};
+        return chosen.pictures < 0 ? "it cannot be decoded" : "one stream of pictures is converted";
     case StreamKind::kSound:
-        if (format.bHasAudio != 0 && (chosen.sound < 0 || chosen.sound == stream.index))
+        if (format.bHasAudio != 0 && (chosen.sound < 0 ? CanBeHeard(stream) : chosen.sound == stream.index))
             return {};
         return WhySoundStays(source, stream, format, copies);
     case StreamKind::kSubtitles:
@@ -274,9 +283,12 @@ std::vector<int> SubtitlesToCarry(const SourceInfo& source, const Request& reque
 }
 
 Chosen ChosenOf(const SourceInfo& source, const Request& request) {
-    return {source.pictures ? source.pictures->index : -1, source.sound ? source.sound->index : -1,
+    return {source.pictures ? source.pictures->index : -1,
+            source.sound ? source.sound->index : -1,
             WantedTracks(source.streams, StreamKind::kSound, request.audioTracks),
-            SubtitlesToCarry(source, request)};
+            SubtitlesToCarry(source, request),
+            request.noVideo,
+            request.noAudio};
 }
 
 /// What goes into the output beside what the engine converts.

@@ -50,6 +50,19 @@ bool HasAdtsHeader(const AVPacket& packet) {
     return packet.size > 7 && packet.data[0] == 0xFF && (packet.data[1] & 0xF6) == 0xF0;
 }
 
+/// What all headers of one form of AAC have in common.
+int FormOf(const AVPacket& packet) {
+    constexpr int kPrivateBit = 0x200;
+    return AV_RB16(packet.data + 2) & 0xFFC0 & ~kPrivateBit; // kind, rate and channels
+}
+
+bool DescribesAnew(const AVPacket& packet, const AVCodecParameters& parameters) {
+    size_t size = 0;
+    const uint8_t* told = av_packet_get_side_data(&packet, AV_PKT_DATA_NEW_EXTRADATA, &size);
+    return told != nullptr && (size != static_cast<size_t>(parameters.extradata_size) ||
+                               std::memcmp(told, parameters.extradata, size) != 0);
+}
+
 /// Whether it is the rest of a frame whose start is missing, as at the start of a recording that was cut.
 bool IsTail(const AVPacket& packet, AVCodecID codec) {
     if (codec != AV_CODEC_ID_AC3 && codec != AV_CODEC_ID_EAC3)
@@ -76,6 +89,7 @@ public:
         const AVBitStreamFilter* filter = av_bsf_get_by_name("aac_adtstoasc");
         int result = filter == nullptr ? AVERROR_BSF_NOT_FOUND : av_bsf_alloc(filter, &context);
         context_.reset(context);
+        form_ = FormOf(first);
         if (result >= 0)
             result = avcodec_parameters_copy(context_->par_in, &parameters);
         if (result >= 0) {
@@ -99,6 +113,8 @@ public:
         parameters.extradata_size = static_cast<int>(size);
     }
 
+    bool HasOtherForm(const AVPacket& packet) const { return FormOf(packet) != form_; }
+
     /// False when the packet is damaged; its content is gone then.
     bool Filter(AVPacket& packet) {
         int result = av_bsf_send_packet(context_.get(), &packet);
@@ -113,6 +129,7 @@ private:
         void operator()(AVBSFContext* context) const { av_bsf_free(&context); }
     };
     std::unique_ptr<AVBSFContext, Free> context_;
+    int form_ = 0;
 };
 
 void CopiedSound::VorbisParserFree::operator()(AVVorbisParseContext* parser) const {
@@ -209,7 +226,10 @@ bool CopiedSound::Cut(Held& first, int64_t until, bool closing) {
 void CopiedSound::Hold(av::Packet packet) {
     if (packet->size <= 0 || (!timeline_ && IsTail(*packet, parameters_->codec_id)))
         return;
-    if (deframer_ && HasAdtsHeader(*packet) && !deframer_->Filter(*packet))
+    const bool hasHeader = deframer_ && HasAdtsHeader(*packet);
+    if (hasHeader ? deframer_->HasOtherForm(*packet) : DescribesAnew(*packet, *parameters_))
+        throw SourceError("its sound changes its form there and cannot be copied on; convert it instead");
+    if (hasHeader && !deframer_->Filter(*packet))
         return;
     av_packet_shrink_side_data(packet.get(), AV_PKT_DATA_NEW_EXTRADATA, 0); // it has been told
     Held held{std::move(packet), 0, 0};

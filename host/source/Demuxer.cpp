@@ -3,7 +3,6 @@
 #include "host/source/MediaTime.h"
 
 #include <algorithm>
-#include <cstdlib>
 #include <limits>
 #include <new>
 #include <string_view>
@@ -18,14 +17,39 @@ constexpr std::size_t kMostBytes = 32 << 20; // while sound stays away
 constexpr int64_t kLatest =
     10 * kTicksPerSecond;               // by which sound may come later in the file than its pictures
 constexpr int kToleratedFailures = 100; // reads in a row that may fail on damaged data
-constexpr int64_t kLargestStep = 10 * kTicksPerSecond; // between packets of one stream; more is a new clock
-constexpr int64_t kLargestFall = kTicksPerSecond / 2;  // likewise, backwards
-constexpr double kPreroll = 0.2;                       // codecs need a little before the first good sample
-constexpr int kProbedPackets = 2000;                   // read to find the picture where decoding can begin
+constexpr double kPreroll = 0.2;        // codecs need a little before the first good sample
+constexpr int kProbedPackets = 2000;    // read to find the picture where decoding can begin
+
+/// Whether the clock of such a source may start anew.
+bool MayJump(const AVFormatContext& context) {
+    return (context.iformat->flags & AVFMT_TS_DISCONT) != 0;
+}
+
+/// All pictures and sound on the clock of what is converted, where that may jump: whatever is converted of
+/// them, the same jumps are found.
+std::vector<int> WitnessesIn(const SourceInfo& info, const AVFormatContext& context) {
+    std::vector<int> witnesses;
+    const int converted = info.pictures ? info.pictures->index : info.sound->index;
+    const std::vector<int>& programs = info.streams[static_cast<std::size_t>(converted)].programs;
+    const auto belongs = [&](const StreamInfo& stream) {
+        return programs == stream.programs || std::any_of(programs.begin(), programs.end(), [&](int program) {
+                   return std::count(stream.programs.begin(), stream.programs.end(), program) > 0;
+               });
+    };
+    for (const StreamInfo& stream : info.streams)
+        if (MayJump(context) && belongs(stream) &&
+            (stream.kind == StreamKind::kPictures || stream.kind == StreamKind::kSound))
+            witnesses.push_back(stream.index);
+    return witnesses;
+}
 
 } // namespace
 
-Demuxer::Demuxer(Source& source, Failures& failures) : source_(source), failures_(failures) {
+Demuxer::Demuxer(Source& source, Failures& failures)
+    : source_(source),
+      failures_(failures),
+      witnesses_(WitnessesIn(source.Info(), *source.Reader().Context())) {
+    source_.Reader().SelectBeside(witnesses_);
     if (const auto& pictures = source.Info().pictures)
         queues_[{pictures->index}];
     if (const auto& sound = source.Info().sound)
@@ -33,7 +57,9 @@ Demuxer::Demuxer(Source& source, Failures& failures) : source_(source), failures
 }
 
 void Demuxer::ReadBeside(const std::vector<int>& streams) {
-    source_.Reader().SelectBeside(streams);
+    std::vector<int> read = witnesses_;
+    read.insert(read.end(), streams.begin(), streams.end());
+    source_.Reader().SelectBeside(read);
     for (const int stream : streams)
         queues_[{stream, true}];
 }
@@ -46,7 +72,7 @@ Demuxer::~Demuxer() {
 
 bool Demuxer::Seek(double seconds) {
     const std::lock_guard lock(mutex_);
-    if (staysAtStart_)
+    if (staysAtStart_ || source_.Info().clockRestarts)
         return false;
     if (started_ || stopping_ || seconds == soughtSeconds_)
         return soughtWell_ && seconds == soughtSeconds_;
@@ -228,7 +254,7 @@ std::optional<int64_t> Demuxer::EndOf(int stream) const {
 
 int Demuxer::ClockJumps() const {
     const std::lock_guard lock(mutex_);
-    return clockJumps_;
+    return clock_.Jumps();
 }
 
 std::size_t Demuxer::Held() const {
@@ -293,8 +319,6 @@ bool Demuxer::ReadOne() {
     failedReads_ = 0;
     const auto taken = queues_.find({packet->stream_index});
     const auto beside = queues_.find({packet->stream_index, true});
-    if (taken == queues_.end() && beside == queues_.end())
-        return true;
     if (awaitsKey_ && packet->stream_index == source_.Info().pictures->index) {
         // Some containers land between key pictures, whatever is asked for. Decoders take the stamps of
         // pictures that build on missing ones for faulty, and those of all that follow, too.
@@ -303,6 +327,8 @@ bool Demuxer::ReadOne() {
             return true;
     }
     RepairClock(*packet);
+    if (taken == queues_.end() && beside == queues_.end())
+        return true;
     av::Packet copy(taken != queues_.end() && beside != queues_.end() ? av_packet_clone(packet.get())
                                                                       : nullptr);
     if (taken != queues_.end() && beside != queues_.end() && !copy)
@@ -332,32 +358,22 @@ std::optional<int64_t> Demuxer::EndOf(const AVPacket& packet) const {
                                       source_.Reader().Context()->streams[packet.stream_index]->time_base);
 }
 
-/// Recordings joined end to end start a new clock in the middle. From there on the stamps of all streams are
-/// shifted so that time goes on where it stopped.
 void Demuxer::RepairClock(AVPacket& packet) {
-    if ((source_.Reader().Context()->iformat->flags & AVFMT_TS_DISCONT) == 0 || packet.dts == AV_NOPTS_VALUE)
+    if (!MayJump(*source_.Reader().Context()) || packet.dts == AV_NOPTS_VALUE)
         return;
     const AVStream* stream = source_.Reader().Context()->streams[packet.stream_index];
     const AVRational mediaBase{1, kTicksPerSecond};
-    const int64_t stamp = av_rescale_q(packet.dts, stream->time_base, mediaBase);
-    const auto due = due_.find(packet.stream_index);
-    int64_t shift = clockShift_;
-    const bool sparse = stream->codecpar->codec_type == AVMEDIA_TYPE_SUBTITLE; // its steps tell nothing
-    if (due != due_.end() && !sparse) {
-        const auto ahead = [&](int64_t candidate) { return stamp + candidate - due->second; };
-        // Where the clock changes, the last packets of one stream can come after the first ones of the other.
-        if (std::abs(ahead(earlierShift_)) < std::abs(ahead(shift)))
-            shift = earlierShift_;
-        if (ahead(shift) > kLargestStep || ahead(shift) < -kLargestFall) {
-            earlierShift_ = clockShift_;
-            shift = clockShift_ = due->second - stamp;
-            const std::lock_guard lock(mutex_);
-            ++clockJumps_;
-        }
+    constexpr int64_t kLongest = 3600 * kTicksPerSecond; // damaged data can tell anything
+    const int64_t length =
+        std::clamp<int64_t>(av_rescale_q(packet.duration, stream->time_base, mediaBase), 0, kLongest);
+    const int64_t stamp = source_.Reader().MediaTime(packet.dts, stream->time_base);
+    int64_t shift = 0;
+    {
+        const std::lock_guard lock(mutex_);
+        shift = stream->codecpar->codec_type == AVMEDIA_TYPE_SUBTITLE
+                    ? clock_.Shift()
+                    : clock_.ShiftFor(packet.stream_index, stamp, length);
     }
-    const int64_t step =
-        packet.duration > 0 ? av_rescale_q(packet.duration, stream->time_base, mediaBase) : 0;
-    due_[packet.stream_index] = stamp + shift + step;
     const int64_t ticks = av_rescale_q(shift, mediaBase, stream->time_base);
     packet.dts += ticks;
     if (packet.pts != AV_NOPTS_VALUE)

@@ -7,6 +7,7 @@
 #ifndef MOVIECONV_HOST_SOURCE_DEMUXER_H
 #define MOVIECONV_HOST_SOURCE_DEMUXER_H
 
+#include "host/source/ClockRepair.h"
 #include "host/source/Failures.h"
 #include "host/source/Source.h"
 #include "thread/Stall.h"
@@ -113,6 +114,7 @@ private:
 
     Source& source_;
     Failures& failures_;
+    const std::vector<int> witnesses_; // read for the clock alone, unless they are taken too
     double soughtSeconds_ = -1;
     bool soughtWell_ = false;
     bool staysAtStart_ = false;
@@ -125,11 +127,8 @@ private:
     bool started_ = false;
     bool stopping_ = false;
     bool ended_ = false;
-    int clockJumps_ = 0;
+    ClockRepair clock_; // changed by the reading thread alone
 
-    int64_t clockShift_ = 0;     // media time added to stamps since the last jump of the source's clock
-    int64_t earlierShift_ = 0;   // the same before that jump
-    std::map<int, int64_t> due_; // where the next packet of a stream is expected, in media time
     int failedReads_ = 0;
     std::thread thread_;
 };

@@ -74,6 +74,24 @@ const AVInputFormat& MovieFile::Recognise(const std::string& url, bool playlists
 }
 
 void MovieFile::Open(const std::string& url, const AVInputFormat& format) {
+    int result = TryToOpen(url, format, false);
+    if (result >= 0 && MayHoldMore() && avio_seek(bytes_.Io(), 0, SEEK_SET) == 0)
+        result = TryToOpen(url, format, true);
+    companions_.AllowRepetition();
+    if (!companions_.Refusal().empty())
+        throw SourceError(CannotOpen(path_, companions_.Refusal()));
+    if (result < 0 && !input_)
+        throw SourceError(CannotOpen(path_, ReasonOf(result)));
+    if (result < 0)
+        throw SourceError("cannot read the streams of \"" + path_ + "\": " + ReasonOf(result));
+}
+
+/// `patiently`: also when a stream begins late. An AVERROR below 0; without an input when it cannot be
+/// opened.
+int MovieFile::TryToOpen(const std::string& url, const AVInputFormat& format, bool patiently) {
+    constexpr int64_t kPatientBytes = 64 << 20;
+    constexpr int64_t kPatientTime = int64_t{120} * AV_TIME_BASE;
+    input_.reset();
     av::Options settings;
     settings.Set("pattern_type", "none"); // "%d" in a name is no pattern
     settings.AllowNoProtocol();
@@ -89,18 +107,35 @@ void MovieFile::Open(const std::string& url, const AVInputFormat& format) {
         throw std::bad_alloc();
     context->pb = bytes_.Io();
     context->interrupt_callback = {WasInterrupted, const_cast<Interruption*>(&bytes_.Interrupter())};
+    if (patiently) {
+        context->probesize = kPatientBytes;
+        context->max_analyze_duration = kPatientTime;
+    }
     companions_.Guard(*context);
-    int result = avformat_open_input(&context, url.c_str(), &format, settings.Get());
+    const int result = avformat_open_input(&context, url.c_str(), &format, settings.Get());
     input_.reset(context);
-    if (result >= 0)
-        result = avformat_find_stream_info(context, nullptr);
-    companions_.AllowRepetition();
-    if (!companions_.Refusal().empty())
-        throw SourceError(CannotOpen(path_, companions_.Refusal()));
-    if (result < 0 && context == nullptr)
-        throw SourceError(CannotOpen(path_, ReasonOf(result)));
-    if (result < 0)
-        throw SourceError("cannot read the streams of \"" + path_ + "\": " + ReasonOf(result));
+    return result < 0 ? result : avformat_find_stream_info(context, nullptr);
+}
+
+/// Whether pictures or sound are announced, or can still come, of which nothing was found yet.
+bool MovieFile::MayHoldMore() const {
+    if (bytes_.Size() == 0 || IsPlaylist())
+        return false;
+    bool pictures = false;
+    bool sound = false;
+    bool unknown = false;
+    for (unsigned i = 0; i < input_->nb_streams; ++i) {
+        const AVCodecParameters& parameters = *input_->streams[i]->codecpar;
+        const bool arePictures = parameters.codec_type == AVMEDIA_TYPE_VIDEO;
+        const bool isSound = parameters.codec_type == AVMEDIA_TYPE_AUDIO;
+        pictures = pictures || arePictures;
+        sound = sound || isSound;
+        unknown =
+            unknown || ((arePictures ? parameters.width == 0 : isSound && parameters.sample_rate == 0) &&
+                        avcodec_find_decoder(parameters.codec_id) != nullptr);
+    }
+    const bool canCome = (input_->ctx_flags & AVFMTCTX_NOHEADER) != 0 && !(pictures && sound);
+    return unknown || canCome;
 }
 
 } // namespace movieconv

@@ -47,6 +47,8 @@ public:
 private:
     const AVInputFormat& Recognise(const std::string& url, bool playlists);
     void Open(const std::string& url, const AVInputFormat& format);
+    int TryToOpen(const std::string& url, const AVInputFormat& format, bool patiently);
+    bool MayHoldMore() const;
 
     const std::string path_;
     CompanionFiles companions_;

@@ -202,7 +202,6 @@ bool PictureDecoder::Deliver(StampRepair::Stamp stamp) {
 
 /// Begins again with more threads and skips the frames that are known, whatever lies between key pictures.
 bool PictureDecoder::UseMoreThreads(const std::vector<av::Packet>& known) {
-    damagedBefore_ += decoder_->Damaged();
     decoder_ = std::make_unique<StreamDecoder>(*parameters_, timeBase_, DecodingThreads::Many());
     skip_ = decoded_;
     return std::all_of(known.begin(), known.end(), [this](const av::Packet& packet) {

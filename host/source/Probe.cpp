@@ -183,15 +183,40 @@ void MeasureDuration(MovieReader& reader, SourceInfo& info) {
         info.duration = kGuessedDuration;
 }
 
-/// Where the clock may start anew, the last stamp says little: files that were joined seem to last for hours.
-/// True when the duration is by the size instead.
+/// Whether stamps fall from one of some places in the file to the next.
+bool FallsSomewhere(MovieReader& reader, const SourceInfo& info, double last) {
+    constexpr int64_t kPlaces = 16;
+    constexpr int64_t kSampleBytes = 256 << 10;
+    constexpr double kMostFall = 0.5; // pictures that build on later ones
+    const bool byPlace = (reader.Context()->iformat->flags & AVFMT_NO_BYTE_SEEK) == 0 &&
+                         av_match_name("ogg", reader.Context()->iformat->name) == 0; // see SeeksAstray
+    double before = 0;
+    for (int64_t place = 1; byPlace && place < kPlaces; ++place) {
+        const int64_t target = info.bytes / kPlaces * place;
+        if (avformat_seek_file(reader.Context(), -1, INT64_MIN, target, INT64_MAX, AVSEEK_FLAG_BYTE) < 0)
+            return false;
+        const Stretch sample = ReadStretch(reader, Counted(info), kSampleBytes, 1);
+        if (sample.packets == 0)
+            continue;
+        if (sample.first < before - kMostFall)
+            return true;
+        before = std::max(before, sample.first);
+    }
+    return last < before - kMostFall;
+}
+
+/// Where the clock may start anew, the last stamp says little: files that were joined seem to last for hours,
+/// or as long as one of them. True when the duration is by the size instead.
 bool DoubtStamps(MovieReader& reader, SourceInfo& info) {
-    if ((reader.Context()->iformat->flags & AVFMT_TS_DISCONT) == 0 || !reader.IsSeekable())
+    if ((reader.Context()->iformat->flags & AVFMT_TS_DISCONT) == 0 || !reader.IsSeekable() ||
+        reader.File().IsPlaylist())
         return false;
     const Stretch tail = ReadTail(reader, info);
+    const bool falls = FallsSomewhere(reader, info, tail.last);
     ReturnToBegin(reader, info);
     const double estimate = tail.length > 0 ? EstimateDuration(reader, info, tail) : 0;
-    if (estimate <= 0 || info.duration < estimate * kMostVariation)
+    info.clockRestarts = falls || (estimate > 0 && info.duration > estimate * kMostVariation);
+    if (estimate <= 0 || !info.clockRestarts)
         return false;
     info.duration = estimate;
     info.certainty = Certainty::kEstimated;

@@ -153,7 +153,8 @@ struct SourceInfo {
 
     std::optional<PictureStreamInfo> pictures; ///< The stream that is converted, probed.
     std::optional<SoundStreamInfo> sound;
-    Promise promise; ///< Of these two.
+    Promise promise;            ///< Of these two.
+    bool clockRestarts = false; ///< Its stamps are known not to tell places in it.
 };
 
 struct SourceChoice {

@@ -40,7 +40,16 @@ bool StreamDecoder::Decode(const AVPacket* packet, const Sink& sink) {
     av::CheckMemory(result);
     if (result < 0 && result != AVERROR_EOF)
         ++damaged_;
-    return Receive(sink);
+    return packet == nullptr ? Drain(sink) : Receive(sink);
+}
+
+/// What comes out behind damage is still to be had.
+bool StreamDecoder::Drain(const Sink& sink) {
+    constexpr int kMostFailures = 1000; // more than any decoder keeps back
+    for (int failures = 0; failures < kMostFailures; ++failures)
+        if (!Receive(sink))
+            return false;
+    return false;
 }
 
 /// Hands out what is decoded. False at the end of the stream or when the sink wants no more.

@@ -31,6 +31,7 @@ public:
 
 private:
     bool Receive(const Sink& sink);
+    bool Drain(const Sink& sink);
 
     av::CodecContext context_;
     av::Frame frame_;

@@ -1,12 +1,16 @@
 // The decoders against real movies, whole, damaged and odd, called as the engine calls them.
 #include "host/source/Movie.h"
+#include "host/source/MovieReader.h"
+#include "host/source/StreamDecoder.h"
 #include "tests/support/Inspect.h"
 #include "tests/support/TestMovies.h"
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cmath>
 #include <fcntl.h>
+#include <memory>
 #include <unistd.h>
 
 namespace {
@@ -306,6 +310,29 @@ TEST(Decoders, SkipDamagedDataAndKeepTime) {
     EXPECT_FALSE(movie.Complaints().empty());
 }
 
+// What a decoder keeps back when the packets end comes out behind an error as well.
+TEST(Decoders, GiveWhatIsWholeBehindDamageAtTheEnd) {
+    const std::string path = Make("noise-end.mp4", {"-f", "lavfi", "-i", "testsrc2=s=320x240:r=25:d=1", "-vf",
+                                                    "noise=alls=60:allf=t", "-c:v", "libx264", "-qp", "10",
+                                                    "-bf", "0", "-g", "1000", "-x264-params", "slices=1"});
+    movieconv::MovieReader reader(path, false, movieconv::Growth::kRead,
+                                  std::make_shared<movieconv::Interruption>());
+    const AVStream& stream = *reader.Context()->streams[0];
+    movieconv::StreamDecoder decoder(*stream.codecpar, stream.time_base, 4);
+    int pictures = 0;
+    const auto count = [&](AVFrame&) { return ++pictures > 0; };
+    const av::Packet packet = av::NewPacket();
+    for (int number = 0; av_read_frame(reader.Context(), packet.get()) >= 0; ++number) {
+        if (number == 23) // of 25
+            std::fill(packet->data + 5, packet->data + packet->size, uint8_t{0});
+        decoder.Decode(packet.get(), count);
+        av_packet_unref(packet.get());
+    }
+    EXPECT_FALSE(decoder.Decode(nullptr, count));
+    EXPECT_EQ(pictures, 24);
+    EXPECT_EQ(decoder.Damaged(), 1);
+}
+
 /// Two transport streams end to end; `mixed`, the second's first pictures come before the last sound of the
 /// first.
 std::string Joined(const std::string& first, const std::string& second, bool mixed) {
@@ -343,6 +370,8 @@ TEST(Decoders, JoinRecordingsThatStartANewClock) {
         EXPECT_EQ(Beginnings(seen, 44100).size(), 8u) << first;
         ASSERT_FALSE(movie.Complaints().empty()) << first;
         EXPECT_NE(movie.Complaints()[0].find("jumped once"), std::string::npos) << movie.Complaints()[0];
+        Movie again(folder / "joined.ts", {});
+        EXPECT_NEAR(static_cast<double>(TakeAll(again, 6).pictures.size()), 50, 5) << first;
     }
 }
 

@@ -6,6 +6,7 @@
 #include <gtest/gtest.h>
 
 #include <string>
+#include <tuple>
 
 namespace {
 
@@ -61,6 +62,24 @@ TEST(CarryOver, PutsIntoTheFileWhatItsFormatHoldsAndTellsTheRest) {
         EXPECT_TRUE(Has(avi.err, std::string("movieconv: not carried: ") + kind)) << avi.err;
     EXPECT_TRUE(Has(Probe(folder / "out.avi"), "tag:title=The whole"));
     EXPECT_EQ(Call({whole, folder / "quiet.avi", "-q"}).err, "");
+}
+
+TEST(CarryOver, TellsPicturesAndSoundThatCannotBeDecoded) {
+    const Folder folder;
+    const std::string known = ReadFile(test_movies::CountedMovie());
+    for (const auto& [codec, unknown, kind, without] :
+         {std::tuple{"V_MPEG4/ISO/ASP", "V_MPEG9/ISO/ASP", "pictures 0", "--no-video"},
+          {"A_PCM/INT/LIT", "A_PCM/INT/TIL", "sound 1", "--no-audio"}}) {
+        std::string content = known;
+        ASSERT_NE(content.find(codec), std::string::npos);
+        WriteFile(folder / "in.mkv",
+                  content.replace(content.find(codec), std::string(codec).size(), unknown));
+        const std::string told = std::string("not carried: ") + kind + ": it cannot be decoded";
+        const Result result = Call({"-y", folder / "in.mkv", folder / "out.mkv"});
+        EXPECT_EQ(result.code, 0) << result.err;
+        EXPECT_TRUE(Has(result.err, told)) << result.err;
+        EXPECT_FALSE(Has(Call({"-y", without, folder / "in.mkv", folder / "out.mkv"}).err, told));
+    }
 }
 
 TEST(CarryOver, KeepsCoversWithTheirNamesAndTitles) {

@@ -231,6 +231,20 @@ TEST(CopiedSound, OfSeveralTracksIsCarriedAsFarAsTheFormatHoldsIt) {
 }
 
 // A recording that was cut begins amid a frame, of which nothing can be heard.
+// What follows would be described wrongly.
+TEST(CopiedSound, EndsWhereItsFormChanges) {
+    const Folder folder;
+    std::string parts;
+    for (const char* channels : {"2", "6"})
+        parts += ReadFile(Make(std::string("form-") + channels + ".ts",
+                               Join(Beeps(2), Words(std::string("-c:a aac -ac ") + channels))));
+    WriteFile(folder / "in.ts", parts);
+    const Result copied = Call({"--audio-codec", "copy", folder / "in.ts", folder / "out.m4a"});
+    EXPECT_EQ(copied.code, 3) << copied.err;
+    EXPECT_TRUE(Has(copied.err, "changes its form there and cannot be copied on")) << copied.err;
+    EXPECT_EQ(Call({"-q", folder / "in.ts", folder / "converted.m4a"}).code, 0);
+}
+
 TEST(CopiedSound, LeavesTheRestOfACutFrameOut) {
     const Folder folder;
     const std::string whole =

@@ -7,6 +7,7 @@
 
 #include <cmath>
 #include <string>
+#include <utility>
 #include <vector>
 
 namespace {
@@ -73,6 +74,36 @@ TEST(Times, OfFewPicturesAreKeptByRepeatingThem) {
             ASSERT_EQ(flashes.size(), beeps.size());
             for (std::size_t i = 0; i < flashes.size(); ++i)
                 EXPECT_NEAR(flashes[i], beeps[i], 0.05);
+        }
+    }
+}
+
+// A stream of a broadcast that begins late, or pauses for long, is neither lost nor out of step.
+TEST(Times, OfStreamsThatBeginLateOrPause) {
+    const Args source =
+        Join(FlashPictures(20), Beeps(20), Args{"-c:v", "mpeg2video", "-q:v", "2", "-c:a", "mp2"});
+    const struct {
+        const char* name;
+        Args filter;
+        std::size_t flashes, beeps;
+    } cases[] = {
+        {"late-sound", {"-af", "aselect='gt(t,11.5)'"}, 20, 8},
+        {"late-pictures", {"-vf", "select='gt(t,11.5)'", "-fps_mode", "passthrough"}, 8, 20},
+        {"sound-pauses", {"-af", "aselect='lt(t,3.5)+gt(t,15.5)'"}, 20, 8},
+        {"pictures-pause", {"-vf", "select='lt(t,3.5)+gt(t,15.5)'", "-fps_mode", "passthrough"}, 8, 20}};
+    for (const auto& test : cases) {
+        for (const char* format : {".ts", ".mpg"}) {
+            SCOPED_TRACE(test.name + std::string(format));
+            const Seen seen =
+                Convert(Make(test.name + std::string(format), Join(source, test.filter)), {}, "mkv");
+            const std::vector<double> flashes = inspect::Flashes(seen);
+            const std::vector<double> beeps = inspect::Beginnings(seen, 44100);
+            ASSERT_EQ(flashes.size(), test.flashes);
+            ASSERT_EQ(beeps.size(), test.beeps);
+            for (const auto& [times, first] :
+                 {std::pair{flashes, 20 - test.flashes}, {beeps, 20 - test.beeps}})
+                for (std::size_t i = times.size() - 4; i < times.size(); ++i)
+                    EXPECT_NEAR(times[i], static_cast<double>(first + i), 0.1);
         }
     }
 }

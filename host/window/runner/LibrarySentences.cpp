@@ -37,6 +37,8 @@ constexpr const char* kSentences[] = {
     QT_TRANSLATE_NOOP("Library", "%1 cannot hold “%2” sound as it is; %3 can"),
     QT_TRANSLATE_NOOP("Library", "%1 cannot begin the sound as it is %2 s behind the pictures; MKV can"),
     QT_TRANSLATE_NOOP("Library", "its sound has no form that could be copied; convert it instead"),
+    QT_TRANSLATE_NOOP("Library",
+                      "its sound changes its form there and cannot be copied on; convert it instead"),
     QT_TRANSLATE_NOOP("Library", "%1 cannot carry pictures as “%2”"),
     QT_TRANSLATE_NOOP("Library", "%1 cannot carry sound as “%2”"),
     QT_TRANSLATE_NOOP("Library", "%1 carries nothing that “%2” holds; choose another format"),

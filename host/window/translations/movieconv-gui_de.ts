@@ -610,6 +610,10 @@
         <translation>der Ton hat keine Form, die sich kopieren ließe; er muss umgewandelt werden</translation>
     </message>
     <message>
+        <source>its sound changes its form there and cannot be copied on; convert it instead</source>
+        <translation>der Ton ändert dort seine Form und lässt sich nicht weiter kopieren; er muss umgewandelt werden</translation>
+    </message>
+    <message>
         <source>there is no file format “%1”</source>
         <translation>es gibt kein Dateiformat „%1“</translation>
     </message>
