@@ -42,7 +42,7 @@ INSTANTIATE_TEST_SUITE_P(
         Recording{"ALaterClock", {{0, 5, 5}, {1, 5, 5}, {0, 900, 6}, {1, 900, 6}, {0, 901, 7}}, 1},
         Recording{"AnEarlierClock", {{0, 50, 50}, {1, 50, 50}, {0, 8, 51}, {1, 8, 51}, {1, 9, 52}}, 1},
         Recording{
-            "TheOldClockBehindTheNewOne", {{0, 5, 5}, {1, 5, 5}, {0, 900, 6}, {1, 6, 6}, {1, 900, 6}}, 1},
+            "TheOldClockBehindTheNewOne", {{0, 5, 5}, {1, 5, 5}, {0, 900, 6}, {1, 6, 6}, {1, 901, 7}}, 1},
         Recording{
             "TheOldClockBehindOneALittleEarlier", {{0, 50, 50}, {1, 50, 50}, {0, 48, 51}, {1, 51, 51}}, 1},
         Recording{
