@@ -3,6 +3,7 @@
 #include "host/convert/CodecPlan.h"
 #include "host/convert/EncodePlan.h"
 #include "host/convert/Room.h"
+#include "host/source/ColourMatrix.h"
 #include "text/Path.h"
 
 #include <algorithm>
@@ -29,7 +30,7 @@ void TellColours(WriterOptions& writer, const PictureStreamInfo& pictures, bool 
     const bool becomesSdr = IsHdr(pictures) && !keepsHdr;
     writer.nColorPrimaries = becomesSdr ? kBt709 : pictures.colorPrimaries;
     writer.nColorTransfer = becomesSdr ? kBt709 : pictures.colorTransfer;
-    writer.nColorMatrix = becomesSdr ? kBt709 : pictures.colorMatrix;
+    writer.nColorMatrix = HandedOutMatrix(pictures, keepsHdr);
     if (keepsHdr && pictures.masteringDisplay) {
         const MasteringDisplay& display = *pictures.masteringDisplay;
         writer.bMasteringDisplay = 1;

@@ -114,7 +114,7 @@ av::Frame PictureConverter::Scale(const AVFrame& picture) {
     av::Frame converted = NewPicture(format_, picture.width, picture.height);
     if (!scaler_)
         return nullptr;
-    const int* coefficients = sws_getCoefficients(picture.colorspace);
+    const int* coefficients = sws_getCoefficients(IsRgb(format) ? rgbMatrix_ : picture.colorspace);
     sws_setColorspaceDetails(scaler_.get(), coefficients, IsFullRange(picture) ? 1 : 0, coefficients, 0, 0,
                              1 << 16, 1 << 16);
     const int rows = sws_scale(scaler_.get(), picture.data, picture.linesize, 0, picture.height,

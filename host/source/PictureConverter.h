@@ -4,6 +4,7 @@
 #define MOVIECONV_HOST_SOURCE_PICTURECONVERTER_H
 
 #include "ffmpeg/AvHandles.h"
+#include "host/source/ColourMatrix.h"
 #include "host/source/SourceInfo.h"
 
 namespace movieconv {
@@ -15,6 +16,7 @@ public:
         : quarterTurns_(stream.quarterTurns),
           mirrored_(stream.mirrored),
           crop_(stream.crop),
+          rgbMatrix_(UsualMatrix(stream)),
           format_(deep ? AV_PIX_FMT_YUV420P10 : AV_PIX_FMT_YUV420P) {}
 
     /// The picture in the engine's form. One that has it already is passed on without a copy. Null when it
@@ -29,6 +31,7 @@ private:
     const int quarterTurns_;
     const bool mirrored_;
     const Crop crop_;
+    const int rgbMatrix_;
     const AVPixelFormat format_;
     av::Scaler scaler_;
 };

@@ -65,7 +65,7 @@ struct PictureStreamInfo {
     bool fullRange = false;
     int colorPrimaries = 2; ///< As in ISO/IEC 23091-2; 2: not stated.
     int colorTransfer = 2;
-    int colorMatrix = 2;
+    int colorMatrix = 2; ///< 0 of all RGB pictures and of no others.
     std::optional<MasteringDisplay> masteringDisplay;
     std::optional<LightLevel> lightLevel;
     bool dolbyVision = false;

@@ -1,5 +1,6 @@
 #include "host/source/StreamDescription.h"
 
+#include "host/source/ColourMatrix.h"
 #include "host/source/MediaTime.h"
 #include "host/source/SubtitleFile.h"
 
@@ -131,13 +132,20 @@ bool HasOpacity(const AVStream* stream, const AVPixFmtDescriptor& format) {
 
 /// Empty where half the resolution in both directions, or none, is all there is.
 std::string FinerThanHalf(const AVPixFmtDescriptor& format) {
-    if ((format.flags & (AV_PIX_FMT_FLAG_RGB | AV_PIX_FMT_FLAG_PAL)) != 0)
+    if (IsRgb(av_pix_fmt_desc_get_id(&format)))
         return "RGB";
     if (format.nb_components < 3 || (format.log2_chroma_w > 0 && format.log2_chroma_h > 0))
         return "";
     if (format.log2_chroma_w == 0)
         return format.log2_chroma_h == 0 ? "4:4:4" : "4:4:0";
     return format.log2_chroma_w == 1 ? "4:2:2" : "4:1:1";
+}
+
+/// The pixels tell RGB: not every container does, and a label of RGB on others is a mistake.
+int MatrixOf(const AVCodecParameters& parameters) {
+    if (IsRgb(static_cast<AVPixelFormat>(parameters.format)))
+        return kMatrixRgb;
+    return parameters.color_space == AVCOL_SPC_RGB ? kMatrixUnstated : parameters.color_space;
 }
 
 PictureStreamInfo DescribePictures(AVFormatContext& context, AVStream* stream) {
@@ -165,7 +173,7 @@ PictureStreamInfo DescribePictures(AVFormatContext& context, AVStream* stream) {
     info.fullRange = parameters.color_range == AVCOL_RANGE_JPEG;
     info.colorPrimaries = parameters.color_primaries;
     info.colorTransfer = parameters.color_trc;
-    info.colorMatrix = parameters.color_space;
+    info.colorMatrix = MatrixOf(parameters);
     ReadLight(stream, info);
     return info;
 }

@@ -1,5 +1,6 @@
 #include "host/source/SubtitleBurner.h"
 
+#include "host/source/ColourMatrix.h"
 #include "host/source/CueList.h"
 
 #include <algorithm>
@@ -9,21 +10,14 @@
 namespace movieconv {
 namespace {
 
-constexpr int kBt709 = 1;
-constexpr int kBt601 = 6;
-constexpr int kUnstated = 2;
-
 OverlayColours ColoursFor(const PictureStreamInfo& pictures, bool keepsHdr) {
-    constexpr int kLeastHdHeight = 720;
     // The signals of the light of a white page, 203 cd/m2.
     constexpr double kWhiteOfPerceptualQuantizer = 0.58;
     constexpr double kWhiteOfHybridLogGamma = 0.75;
-    if (IsHdr(pictures) && !keepsHdr)
-        return {kBt709, 1};
-    OverlayColours colours{pictures.colorMatrix, 1};
-    if (colours.matrix == kUnstated)
-        colours.matrix = pictures.height >= kLeastHdHeight ? kBt709 : kBt601;
-    if (IsHdr(pictures))
+    OverlayColours colours{HandedOutMatrix(pictures, keepsHdr), 1};
+    if (colours.matrix == kMatrixUnstated)
+        colours.matrix = UsualMatrix(pictures);
+    if (IsHdr(pictures) && keepsHdr)
         colours.white = pictures.colorTransfer == kPerceptualQuantizer ? kWhiteOfPerceptualQuantizer
                                                                        : kWhiteOfHybridLogGamma;
     return colours;

@@ -5,6 +5,7 @@
 
 #include <gtest/gtest.h>
 
+#include <array>
 #include <string>
 
 namespace {
@@ -61,6 +62,43 @@ TEST(UnusualPictures, WhatTheyLoseIsTold) {
         if (test.colours) {
             EXPECT_TRUE(tells(std::string("its ") + test.colours + " pictures")) << result.err;
         }
+    }
+}
+
+/// Labelled as RGB or not, in sizes for which players take different matrices.
+TEST(UnusualPictures, RgbIsShownInItsColoursByWhatTheOutputSays) {
+    const struct {
+        const char* name;
+        Args encoding;
+        const char* size;
+        const char* output;
+        const char* matrix;
+    } cases[] = {
+        {"rgb-labelled.mkv", {"-c:v", "libx264rgb", "-qp", "0"}, "320x240", "o.mp4", "smpte170m"},
+        {"rgb-labelled-hd.mkv", {"-c:v", "libx264rgb", "-qp", "0"}, "1280x720", "o.mp4", "bt709"},
+        {"rgb-qt.mov", {"-c:v", "qtrle"}, "320x240", "o.mkv", "smpte170m"},
+        {"rgb-ffv1-hd.mkv", {"-c:v", "ffv1", "-pix_fmt", "bgr0"}, "1280x720", "o.mp4", "bt709"},
+        {"rgb-palette-hd.gif", {}, "1280x720", "o.mp4", "bt709"},
+        {"rgb-png-hd.mkv", {"-c:v", "png"}, "1280x720", "o.gif", nullptr},
+    };
+    constexpr std::array kRed{0xC0, 0x30, 0x20};
+    for (const auto& test : cases) {
+        SCOPED_TRACE(test.name);
+        const Folder folder;
+        const std::string source = Make(
+            test.name, Join(Lavfi(std::string("color=0xC03020:r=5:d=0.4:s=") + test.size + ",format=gbrp"),
+                            test.encoding));
+        const Result result = Call({"--preset", "standard", source, folder / test.output});
+        ASSERT_EQ(result.code, 0) << result.err;
+        const std::string made = folder / test.output;
+        if (test.matrix) {
+            EXPECT_EQ(Ffprobe(made, Words("-show_entries stream=color_space -of csv=p=0")),
+                      std::string(test.matrix) + "\n");
+        }
+        const std::string picture = FfmpegReads(made, Words("-frames:v 1 -f rawvideo -pix_fmt rgb24"));
+        ASSERT_GT(picture.size(), 3u);
+        for (size_t i = 0; i < kRed.size(); ++i)
+            EXPECT_NEAR(static_cast<unsigned char>(picture[i]), kRed[i], 5) << i;
     }
 }
 
