@@ -66,7 +66,7 @@ private:
     // The taking thread's.
     Planes taken_;
     std::optional<PictureFilter> filter_;
-    PictureConverter converter_{PictureStreamInfo{}, false};
+    PictureConverter converter_{PictureStreamInfo{}, false, false};
 };
 
 } // namespace movieconv

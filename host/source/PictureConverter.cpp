@@ -1,8 +1,14 @@
 #include "host/source/PictureConverter.h"
 
+#include <algorithm>
+#include <cmath>
 #include <cstddef>
 #include <new>
 #include <utility>
+
+extern "C" {
+#include <libavutil/imgutils.h>
+}
 
 namespace movieconv {
 namespace {
@@ -16,6 +22,30 @@ av::Frame NewPicture(AVPixelFormat format, int width, int height) {
     if (av_frame_get_buffer(picture.get(), 0) < 0)
         throw std::bad_alloc();
     return picture;
+}
+
+bool IsOnSide(int quarterTurns) {
+    return quarterTurns % 2 != 0;
+}
+
+/// The picture in the middle of a black one.
+av::Frame Bordered(const AVFrame& picture, int width, int height) {
+    const auto format = static_cast<AVPixelFormat>(picture.format);
+    av::Frame whole = NewPicture(format, width, height);
+    const ptrdiff_t pitches[4] = {whole->linesize[0], whole->linesize[1], whole->linesize[2], 0};
+    av_image_fill_black(whole->data, pitches, format, AVCOL_RANGE_MPEG, width, height);
+    const int left = (width - picture.width) / 4 * 2;
+    const int top = (height - picture.height) / 4 * 2;
+    const int sampleBytes = format == AV_PIX_FMT_YUV420P10 ? 2 : 1;
+    for (int plane = 0; plane < 3; ++plane) {
+        const int part = plane == 0 ? 1 : 2;
+        uint8_t* begin = whole->data[plane] + static_cast<ptrdiff_t>(top / part) * whole->linesize[plane] +
+                         left / part * sampleBytes;
+        av_image_copy_plane(begin, whole->linesize[plane], picture.data[plane], picture.linesize[plane],
+                            (picture.width + part - 1) / part * sampleBytes,
+                            (picture.height + part - 1) / part);
+    }
+    return whole;
 }
 
 bool IsFullRange(const AVFrame& picture) {
@@ -79,9 +109,19 @@ void TurnPlanes(const AVFrame& picture, AVFrame& turned, int quarterTurns, bool 
 
 } // namespace
 
+PictureConverter::PictureConverter(const PictureStreamInfo& stream, bool deep, bool drawnInto)
+    : quarterTurns_(stream.quarterTurns),
+      mirrored_(stream.mirrored),
+      crop_(stream.crop),
+      rgbMatrix_(UsualMatrix(stream)),
+      format_(deep ? AV_PIX_FMT_YUV420P10 : AV_PIX_FMT_YUV420P),
+      pixelShape_(IsOnSide(quarterTurns_) ? 1 / PixelShape(stream) : PixelShape(stream)),
+      size_(drawnInto || !crop_.CutsNothing() ? std::optional(StoredSize(stream)) : std::nullopt) {}
+
 av::Frame PictureConverter::Convert(AVFrame& picture) {
+    const bool hasSize = !size_ || *size_ == Size{picture.width, picture.height};
     av::Frame converted;
-    if (picture.format == format_ && !IsFullRange(picture)) {
+    if (picture.format == format_ && !IsFullRange(picture) && hasSize) {
         converted = av::NewFrame();
         av_frame_move_ref(converted.get(), &picture);
     } else {
@@ -95,10 +135,8 @@ av::Frame PictureConverter::Convert(AVFrame& picture) {
     return converted;
 }
 
-/// Moves the edges, not the pixels. A picture that has become too small for it on the way stays whole.
+/// Moves the edges, not the pixels.
 void PictureConverter::Cut(AVFrame& picture) const {
-    if (picture.width <= crop_.left + crop_.right || picture.height <= crop_.top + crop_.bottom)
-        return;
     picture.crop_top = static_cast<size_t>(crop_.top);
     picture.crop_bottom = static_cast<size_t>(crop_.bottom);
     picture.crop_left = static_cast<size_t>(crop_.left);
@@ -106,12 +144,37 @@ void PictureConverter::Cut(AVFrame& picture) const {
     av_frame_apply_cropping(&picture, AV_FRAME_CROP_UNALIGNED);
 }
 
+PictureConverter::Size PictureConverter::StoredSize(const PictureStreamInfo& stream) {
+    const Size whole{stream.width + stream.crop.left + stream.crop.right,
+                     stream.height + stream.crop.top + stream.crop.bottom};
+    return IsOnSide(stream.quarterTurns) ? Size{whole.height, whole.width} : whole;
+}
+
+/// How large the picture becomes in one of the size `whole`, where it keeps its shape unless that is nearly
+/// the same.
+PictureConverter::Size PictureConverter::SizeWithin(const Size& whole, const AVFrame& picture) const {
+    constexpr double kSameShape = 0.02;
+    if (whole == Size{picture.width, picture.height})
+        return whole;
+    const AVRational pixel = picture.sample_aspect_ratio;
+    const double widening = pixel.num > 0 && pixel.den > 0 ? av_q2d(pixel) / pixelShape_ : 1;
+    const double scaleX = whole.width / (picture.width * widening);
+    const double scaleY = static_cast<double>(whole.height) / picture.height;
+    if (std::abs(scaleX / scaleY - 1) < kSameShape)
+        return whole;
+    const auto even = [](double length) { return std::max(2, static_cast<int>(length / 2) * 2); };
+    return scaleX < scaleY ? Size{whole.width, even(picture.height * scaleX)}
+                           : Size{even(picture.width * widening * scaleY), whole.height};
+}
+
 av::Frame PictureConverter::Scale(const AVFrame& picture) {
     const auto format = static_cast<AVPixelFormat>(picture.format);
-    scaler_.reset(sws_getCachedContext(scaler_.release(), picture.width, picture.height, format,
-                                       picture.width, picture.height, format_, SWS_BICUBIC | SWS_ACCURATE_RND,
-                                       nullptr, nullptr, nullptr));
-    av::Frame converted = NewPicture(format_, picture.width, picture.height);
+    const Size whole = size_.value_or(Size{picture.width, picture.height});
+    const Size size = size_ ? SizeWithin(whole, picture) : whole;
+    scaler_.reset(sws_getCachedContext(scaler_.release(), picture.width, picture.height, format, size.width,
+                                       size.height, format_, SWS_BICUBIC | SWS_ACCURATE_RND, nullptr, nullptr,
+                                       nullptr));
+    av::Frame converted = NewPicture(format_, size.width, size.height);
     if (!scaler_)
         return nullptr;
     const int* coefficients = sws_getCoefficients(IsRgb(format) ? rgbMatrix_ : picture.colorspace);
@@ -119,11 +182,13 @@ av::Frame PictureConverter::Scale(const AVFrame& picture) {
                              1 << 16, 1 << 16);
     const int rows = sws_scale(scaler_.get(), picture.data, picture.linesize, 0, picture.height,
                                converted->data, converted->linesize);
-    return rows > 0 ? std::move(converted) : nullptr;
+    if (rows <= 0)
+        return nullptr;
+    return size == whole ? std::move(converted) : Bordered(*converted, whole.width, whole.height);
 }
 
 av::Frame PictureConverter::Turn(const AVFrame& picture) const {
-    const bool onSide = quarterTurns_ % 2 != 0;
+    const bool onSide = IsOnSide(quarterTurns_);
     const int width = onSide ? picture.height : picture.width;
     const int height = onSide ? picture.width : picture.height;
     av::Frame turned = NewPicture(format_, width, height);

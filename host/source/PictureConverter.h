@@ -7,23 +7,30 @@
 #include "host/source/ColourMatrix.h"
 #include "host/source/SourceInfo.h"
 
+#include <optional>
+
 namespace movieconv {
 
 class PictureConverter {
 public:
-    /// Pictures of such a stream are mirrored, turned and cropped as it says. `deep`: they get 10 bits.
-    PictureConverter(const PictureStreamInfo& stream, bool deep)
-        : quarterTurns_(stream.quarterTurns),
-          mirrored_(stream.mirrored),
-          crop_(stream.crop),
-          rgbMatrix_(UsualMatrix(stream)),
-          format_(deep ? AV_PIX_FMT_YUV420P10 : AV_PIX_FMT_YUV420P) {}
+    /// Pictures of such a stream are mirrored, turned and cropped as it says. `deep`: they get 10 bits. Where
+    /// they are cropped or `drawnInto`, those of other sizes are brought to the one that the stream tells,
+    /// for which the places are meant.
+    PictureConverter(const PictureStreamInfo& stream, bool deep, bool drawnInto);
 
     /// The picture in the engine's form. One that has it already is passed on without a copy. Null when it
     /// cannot be converted, as with a damaged size.
     av::Frame Convert(AVFrame& picture);
 
 private:
+    struct Size {
+        int width;
+        int height;
+        bool operator==(const Size&) const = default;
+    };
+
+    static Size StoredSize(const PictureStreamInfo& stream);
+    Size SizeWithin(const Size& whole, const AVFrame& picture) const;
     av::Frame Scale(const AVFrame& picture);
     av::Frame Turn(const AVFrame& picture) const;
     void Cut(AVFrame& picture) const;
@@ -33,6 +40,8 @@ private:
     const Crop crop_;
     const int rgbMatrix_;
     const AVPixelFormat format_;
+    const double pixelShape_;        // as stored, width to height
+    const std::optional<Size> size_; // as stored; without one each picture keeps its own
     av::Scaler scaler_;
 };
 

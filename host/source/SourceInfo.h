@@ -72,6 +72,12 @@ struct PictureStreamInfo {
     Crop crop{}; ///< What is cut off; even numbers.
 };
 
+/// Width to height of a pixel as shown.
+inline double PixelShape(const PictureStreamInfo& pictures) {
+    const AVRational aspect = pictures.pixelAspect;
+    return aspect.num > 0 && aspect.den > 0 ? av_q2d(aspect) : 1;
+}
+
 // Of PictureStreamInfo::colorTransfer.
 constexpr int kPerceptualQuantizer = 16;
 constexpr int kHybridLogGamma = 18;

@@ -185,7 +185,7 @@ public:
           fonts_(std::move(fonts)),
           width_(pictures.width),
           height_(pictures.height),
-          shownWidth_(std::max(2, static_cast<int>(std::lround(width_ * Shape(pictures))))) {}
+          shownWidth_(std::max(2, static_cast<int>(std::lround(width_ * PixelShape(pictures))))) {}
 
     bool Changes(int64_t time) override {
         const std::vector<Event>& events = script_.Events();
@@ -222,11 +222,6 @@ public:
     }
 
 private:
-    static double Shape(const PictureStreamInfo& pictures) {
-        return pictures.pixelAspect.num > 0 && pictures.pixelAspect.den > 0 ? av_q2d(pictures.pixelAspect)
-                                                                            : 1;
-    }
-
     av::Frame NewCanvas() const {
         av::Frame picture = av::NewFrame();
         picture->format = AV_PIX_FMT_RGBA;

@@ -128,6 +128,42 @@ TEST(Burn, FollowsRangesClipsCroppingAndScaling) {
     EXPECT_NEAR(scaled.bottom, 212, 3);
 }
 
+/// A stream of small pictures goes on with larger ones, wider ones, and those of pixels that are wider
+/// instead.
+TEST(Burn, StaysInItsPlaceWhenThePicturesChangeTheirSize) {
+    const Folder folder;
+    const struct {
+        const char* size;
+        const char* aspect; // of a pixel
+        int lit;            // columns of the first size that its pictures fill
+    } parts[] = {{"160x120", "1", 160}, {"320x240", "1", 160}, {"120x120", "4/3", 160}, {"120x240", "1", 60}};
+    std::string joined;
+    for (const auto& part : parts) {
+        Ffmpeg(Join(Lavfi(std::string("color=0x404040:r=10:d=0.5:s=") + part.size + ",setsar=" + part.aspect),
+                    Words("-c:v mpeg2video -q:v 2 -f mpegts -output_ts_offset " +
+                          std::to_string(1 + 0.5 * static_cast<double>(&part - parts))),
+                    Args{folder / "part.ts"}));
+        joined += ReadFile(folder / "part.ts");
+    }
+    WriteFile(folder / "a.ts", joined);
+    WriteFile(folder / "words.srt", "1\n00:00:00,000 --> 00:00:09,000\nWORDS\n");
+    const Result made = Call({folder / "a.ts", folder / "o.mkv", "--burn-subtitles", folder / "words.srt",
+                              "--crop", "20:0:0:0", "--video-codec", "FFV1", "-q"});
+    ASSERT_EQ(made.code, 0) << made.err;
+    const std::vector<Box> words = BoxesOf(folder / "o.mkv", 160, 100);
+    const std::string rows = FfmpegReads(folder / "o.mkv", Words("-map 0:v:0 -f rawvideo -pix_fmt gray"));
+    ASSERT_EQ(words.size(), 20u);
+    for (size_t i = 2; i < words.size(); i += 5) { // in the middle of each part
+        SCOPED_TRACE(i);
+        EXPECT_NEAR(words[i].left, words[2].left, 1);
+        EXPECT_NEAR(words[i].top, words[2].top, 1);
+        EXPECT_NEAR(words[i].right, words[2].right, 1);
+        EXPECT_NEAR(words[i].bottom, words[2].bottom, 1);
+        const auto row = rows.begin() + static_cast<std::ptrdiff_t>(i * 160 * 100);
+        EXPECT_NEAR(std::count_if(row, row + 160, [](char luma) { return luma > 40; }), parts[i / 5].lit, 2);
+    }
+}
+
 TEST(Burn, TakesFilesAndTheFontsOfTheSource) {
     const Folder folder;
     WriteFile(folder / "latin.srt", "1\n00:00:01,000 --> 00:00:02,000\nGr\xFC\xDF"
