@@ -74,6 +74,8 @@ auto Opened(Open open) {
         throw Failure(Category::kRequest, error.what());
     } catch (const CropError& error) {
         throw Failure(Category::kRequest, error.what());
+    } catch (const ScratchError& error) {
+        throw Failure(Category::kOutput, error.what());
     } catch (const SourceError& error) {
         throw Failure(Category::kSource, error.what());
     }

@@ -33,9 +33,9 @@ public:
 };
 
 /// For pictures such as `pictures` tells, upright and cropped; positions are those in them. Fonts are for
-/// texts.
+/// texts. Throw SourceError; ScratchError without a folder for temporary files.
 std::unique_ptr<CueDrawer> MakeTextDrawer(CueList list, const PictureStreamInfo& pictures,
-                                          std::vector<FontFile> fonts);
+                                          const std::vector<FontFile>& fonts);
 std::unique_ptr<CueDrawer> MakeBitmapDrawer(CueList list, const PictureStreamInfo& pictures);
 
 } // namespace movieconv

@@ -133,7 +133,7 @@ bool Demuxer::KeyPictureAtOrBefore(int64_t mediaTime) {
 
 void Demuxer::Start() {
     if (!started_ && !stopping_) {
-        thread_ = std::thread(&Demuxer::Run, this);
+        thread_ = NewThread([this] { Run(); });
         started_ = true;
     }
 }

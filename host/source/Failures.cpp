@@ -10,13 +10,20 @@ namespace {
 /// Writes what went wrong into `reason`, which stays as it is when there is no memory for it.
 void Describe(const std::exception& error, std::string& reason) noexcept {
     try {
-        const bool threads = dynamic_cast<const std::system_error*>(&error) != nullptr;
-        reason = std::string(threads ? "no thread can be started: " : "") + error.what();
+        reason = error.what();
     } catch (const std::bad_alloc&) {
     }
 }
 
 } // namespace
+
+std::thread NewThread(std::function<void()> work) {
+    try {
+        return std::thread(std::move(work));
+    } catch (const std::system_error& error) {
+        throw ThreadError(std::string("no thread can be started: ") + error.what());
+    }
+}
 
 void Failures::Note(std::string reason) noexcept {
     const std::lock_guard lock(mutex_);

@@ -6,9 +6,20 @@
 #include <exception>
 #include <functional>
 #include <mutex>
+#include <stdexcept>
 #include <string>
+#include <thread>
 
 namespace movieconv {
+
+/// There is no thread to be had.
+class ThreadError : public std::runtime_error {
+public:
+    using std::runtime_error::runtime_error;
+};
+
+/// A thread that does the work. Throws ThreadError.
+std::thread NewThread(std::function<void()> work);
 
 /// For any thread.
 class Failures {

@@ -72,8 +72,7 @@ void PictureDecoder::EndAt(double seconds) {
 
 VideoImage* PictureDecoder::GetCurrentImage() {
     if (!ended_ && !current_.frame) {
-        ended_ =
-            !failures_.Attempt([this] { thread_ = std::thread(&PictureDecoder::Run, this); }) || !Advance();
+        ended_ = !failures_.Attempt([this] { thread_ = NewThread([this] { Run(); }); }) || !Advance();
     }
     return ended_ ? nullptr : &image_;
 }

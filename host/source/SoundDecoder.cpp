@@ -65,8 +65,7 @@ double SoundDecoder::SecondsDelivered() const {
 }
 
 AudioFrame* SoundDecoder::GetNextFrame() {
-    if (!thread_.joinable() &&
-        !failures_.Attempt([this] { thread_ = std::thread(&SoundDecoder::Run, this); }))
+    if (!thread_.joinable() && !failures_.Attempt([this] { thread_ = NewThread([this] { Run(); }); }))
         return nullptr;
     while (used_ == static_cast<int64_t>(current_.size())) {
         std::optional<PcmDecoder::Chunk> next = queue_.Pop();

@@ -31,6 +31,12 @@ public:
     using SourceError::SourceError;
 };
 
+/// There is no folder that temporary files can be written into.
+class ScratchError : public SourceError {
+public:
+    using SourceError::SourceError;
+};
+
 } // namespace movieconv
 
 #endif

@@ -34,11 +34,12 @@ struct Event {
 class ScriptFolder {
 public:
     ScriptFolder(const std::string& script, const std::vector<FontFile>& fonts) {
-        std::string path = (std::filesystem::temp_directory_path() / "movieconv-XXXXXX").string();
-        if (mkdtemp(path.data()) == nullptr)
-            throw SourceError(
-                fmt::format("cannot make a folder for the subtitles: {}", std::strerror(errno)));
-        path_ = path;
+        std::error_code error;
+        path_ = (std::filesystem::temp_directory_path(error) / "movieconv-XXXXXX").string();
+        if (!error && mkdtemp(path_.data()) == nullptr)
+            error = {errno, std::generic_category()};
+        if (error)
+            throw ScratchError(fmt::format("cannot make a folder for the subtitles: {}", error.message()));
         Write("script.ass", script.data(), script.size());
         for (std::size_t i = 0; i < fonts.size(); ++i)
             Write(std::to_string(i), fonts[i].data(), fonts[i].size());
@@ -57,7 +58,7 @@ private:
         std::ofstream file(path_ + "/" + name, std::ios::binary);
         file.write(static_cast<const char*>(data), static_cast<std::streamsize>(size));
         if (!file.flush())
-            throw SourceError(fmt::format("cannot write the subtitles to \"{}\"", path_));
+            throw ScratchError(fmt::format("cannot write the subtitles to \"{}\"", path_));
     }
 
     std::string path_;
@@ -180,12 +181,14 @@ private:
 
 class TextDrawer final : public CueDrawer {
 public:
-    TextDrawer(const CueList& list, const PictureStreamInfo& pictures, std::vector<FontFile> fonts)
+    TextDrawer(const CueList& list, const PictureStreamInfo& pictures, const std::vector<FontFile>& fonts)
         : script_(list),
-          fonts_(std::move(fonts)),
           width_(pictures.width),
           height_(pictures.height),
-          shownWidth_(std::max(2, static_cast<int>(std::lround(width_ * PixelShape(pictures))))) {}
+          shownWidth_(std::max(2, static_cast<int>(std::lround(width_ * PixelShape(pictures))))) {
+        if (!script_.Events().empty())
+            Drawing([&] { Start(fonts); });
+    }
 
     bool Changes(int64_t time) override {
         const std::vector<Event>& events = script_.Events();
@@ -208,20 +211,26 @@ public:
         if (active_.empty())
             return {};
         av::Frame picture = NewCanvas();
-        try {
-            if (!graph_)
-                Start(*picture);
-            // The middle of the millisecond, lest rounding changes it.
-            picture->pts = time / (kTicksPerSecond / 1000) * 1000 + 500;
+        // The middle of the millisecond, lest rounding changes it.
+        picture->pts = time / (kTicksPerSecond / 1000) * 1000 + 500;
+        Drawing([&] {
             graph_->Push(*picture);
             picture = graph_->Take();
-        } catch (const av::FilterError& error) {
-            throw SourceError(std::string("the subtitles cannot be drawn: ") + error.what());
-        }
+        });
         return picture ? Trimmed(picture->data[0], picture->linesize[0], width_, height_) : Canvas{};
     }
 
 private:
+    /// Does `work` with the graph, whose errors are the source's.
+    template <class Work>
+    static void Drawing(Work work) {
+        try {
+            work();
+        } catch (const av::FilterError& error) {
+            throw SourceError(std::string("the subtitles cannot be drawn: ") + error.what());
+        }
+    }
+
     av::Frame NewCanvas() const {
         av::Frame picture = av::NewFrame();
         picture->format = AV_PIX_FMT_RGBA;
@@ -234,21 +243,19 @@ private:
         return picture;
     }
 
-    void Start(const AVFrame& form) {
-        const ScriptFolder folder(script_.Text(), fonts_);
-        graph_.emplace(form,
+    void Start(const std::vector<FontFile>& fonts) {
+        const ScriptFolder folder(script_.Text(), fonts);
+        graph_.emplace(*NewCanvas(),
                        fmt::format("ass=filename={0}/script.ass:fontsdir={0}:alpha=1:original_size={1}x{2}",
                                    Quoted(folder.Path()), shownWidth_, height_),
                        1, kMicrosecond);
-        fonts_.clear();
     }
 
     const Script script_;
-    std::vector<FontFile> fonts_;
     const int width_;
     const int height_;
-    const int shownWidth_; // with square pixels
-    std::optional<av::FilterGraph> graph_;
+    const int shownWidth_;                 // with square pixels
+    std::optional<av::FilterGraph> graph_; // unless there is nothing to draw
     std::size_t next_ = 0;
     std::vector<const Event*> active_;
 };
@@ -256,8 +263,8 @@ private:
 } // namespace
 
 std::unique_ptr<CueDrawer> MakeTextDrawer(CueList list, const PictureStreamInfo& pictures,
-                                          std::vector<FontFile> fonts) {
-    return std::make_unique<TextDrawer>(list, pictures, std::move(fonts));
+                                          const std::vector<FontFile>& fonts) {
+    return std::make_unique<TextDrawer>(list, pictures, fonts);
 }
 
 } // namespace movieconv

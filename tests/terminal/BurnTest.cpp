@@ -289,6 +289,11 @@ TEST(Burn, RefusesWhatIsNotThere) {
         EXPECT_EQ(made.code, 2) << made.err;
         EXPECT_NE(made.err.find(test.text), std::string::npos) << made.err;
     }
+    const std::string nowhere = "TMPDIR=" + folder / "none";
+    const Result made = program::Run({"env", nowhere, MOVIECONV_PROGRAM, whole_movie::Make(true),
+                                      folder / "out.mp4", "--burn-subtitles", "4"});
+    EXPECT_EQ(made.code, 4);
+    EXPECT_EQ(made.err, "movieconv: error: cannot make a folder for the subtitles: No such file or directory\n");
     EXPECT_TRUE(folder.Names().empty());
 }
 
