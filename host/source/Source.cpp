@@ -2,6 +2,7 @@
 
 #include "host/source/Languages.h"
 #include "host/source/Probe.h"
+#include "host/source/SourceTexts.h"
 #include "host/source/StreamChoice.h"
 #include "host/source/StreamDescription.h"
 #include "host/source/SubtitleFile.h"
@@ -100,6 +101,7 @@ Source::Source(const std::string& path, const SourceChoice& choice,
     TakeNotes(reader_.File().Notes(), info_);
     const ChosenStreams chosen = ChooseStreams(info_.streams, choice);
     WantedTracks(info_.streams, StreamKind::kSubtitles, choice.subtitles); // throws
+    PutTextsRight(context.iformat->name, info_);
     std::vector<int> selected;
     if (chosen.pictures >= 0) {
         selected.push_back(chosen.pictures);

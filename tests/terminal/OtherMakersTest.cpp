@@ -6,7 +6,9 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <string>
+#include <utility>
 
 namespace {
 
@@ -151,6 +153,42 @@ TEST(OtherMakers, TextsOfMp4AreFoundWhereverTheyAre) {
     EXPECT_EQ(Call({folder / "phone.mov", folder / "phone.mp4", "--progress", "none"}).err, "");
     EXPECT_EQ(whole_movie::Probe(folder / "phone.mp4")["format"]["tags"].value("location", ""),
               "+48.1000+011.6000/");
+}
+
+/// Which FFmpeg reads with the streams.
+TEST(OtherMakers, TextsOfOggAreTheMovies) {
+    const Folder folder;
+    const auto make = [&](const char* name, const Args& options) {
+        ASSERT_EQ(program::Run(Join(Args{"ffmpeg", "-v", "error", "-f", "lavfi", "-i", "sine=d=1"}, options,
+                                    Args{"-metadata", "title=T", "-metadata", "MOOD=calm", folder / name}))
+                      .code,
+                  0);
+    };
+    make("a.ogg", {"-c:a", "libvorbis"});
+    make("a.opus", {"-c:a", "libopus", "-metadata", "CHAPTER001URL=none"});
+    make("a.ogv", Join(CountedPictures(1), Args{"-map", "0", "-map", "1", "-c:v", "libtheora", "-c:a",
+                                                "libvorbis", "-metadata:s:1", "title=Noises"}));
+    const struct {
+        const char* from;
+        const char* to;
+        const char* title; ///< Of a track.
+    } cases[] = {{"a.ogg", "a.mp3", ""},
+                 {"a.ogg", "a.flac", ""},
+                 {"a.ogg", "b.ogg", ""},
+                 {"a.opus", "a.mka", ""},
+                 {"a.ogv", "a.mkv", "Noises"}};
+    for (const auto& test : cases) {
+        SCOPED_TRACE(test.to);
+        EXPECT_EQ(Call({folder / test.from, folder / test.to, "--progress", "none"}).err, "");
+        const Json probe = whole_movie::Probe(folder / test.to);
+        const auto tags = whole_movie::TagsOf(probe);
+        for (const auto& tag : {std::pair<std::string, std::string>("title", "T"), {"mood", "calm"}})
+            EXPECT_EQ(std::count(tags.begin(), tags.end(), tag), 1) << tag.first;
+        const Json& track = probe["streams"].front();
+        if (track.contains("tags") && std::string(test.to) != "b.ogg") {
+            EXPECT_EQ(track["tags"].value("title", ""), test.title);
+        }
+    }
 }
 
 /// Chapters, texts and an attached file, as mkvmerge writes them from what people give it.

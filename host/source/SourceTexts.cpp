@@ -1,0 +1,64 @@
+#include "host/source/SourceTexts.h"
+
+#include <algorithm>
+#include <cctype>
+#include <cstddef>
+#include <string>
+#include <vector>
+
+extern "C" {
+#include <libavutil/avstring.h>
+}
+
+namespace movieconv {
+namespace {
+
+const Tag* TextAt(const std::vector<Tag>& tags, const std::string& key) {
+    const auto found = std::find_if(tags.begin(), tags.end(), [&](const Tag& tag) {
+        return av_strcasecmp(tag.key.c_str(), key.c_str()) == 0;
+    });
+    return found != tags.end() ? &*found : nullptr;
+}
+
+template <class Test>
+void RemoveIf(std::vector<Tag>& tags, Test test) {
+    tags.erase(std::remove_if(tags.begin(), tags.end(), test), tags.end());
+}
+
+/// Whether it is one of the comments that tell a chapter, CHAPTER001 and the like.
+bool TellsAChapter(const std::string& key) {
+    constexpr std::string_view kName = "CHAPTER";
+    constexpr std::size_t kDigits = 3;
+    return key.size() >= kName.size() + kDigits &&
+           av_strncasecmp(key.c_str(), kName.data(), kName.size()) == 0 &&
+           std::all_of(key.begin() + kName.size(), key.begin() + kName.size() + kDigits,
+                       [](unsigned char letter) { return std::isdigit(letter) != 0; });
+}
+
+/// Ogg keeps the movie's texts with its streams: what the first one says is the movie's, what another one
+/// says otherwise stays its own.
+void TakeTextsOfStreams(SourceInfo& info) {
+    const auto takes = [&](const Tag& tag) {
+        const Tag* const known = TextAt(info.tags, tag.key);
+        const bool isNew = known == nullptr && !TellsAChapter(tag.key);
+        if (isNew)
+            info.tags.push_back(tag);
+        return known == nullptr || known->value == tag.value;
+    };
+    for (StreamInfo& stream : info.streams) {
+        if (stream.kind == StreamKind::kCover || stream.kind == StreamKind::kAttachment)
+            continue;
+        if (!stream.title.empty() && takes({"title", stream.title}))
+            stream.title.clear();
+        RemoveIf(stream.tags, takes);
+    }
+}
+
+} // namespace
+
+void PutTextsRight(std::string_view container, SourceInfo& info) {
+    if (container == "ogg")
+        TakeTextsOfStreams(info);
+}
+
+} // namespace movieconv
