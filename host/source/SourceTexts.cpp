@@ -54,11 +54,38 @@ void TakeTextsOfStreams(SourceInfo& info) {
     }
 }
 
+/// AVI and WAV have the album as a product, and beside what people wrote the program that wrote the file.
+void UseUsualNames(std::vector<Tag>& tags) {
+    RemoveIf(tags, [](const Tag& tag) { return tag.key == "software"; });
+    for (Tag& tag : tags)
+        if (tag.key == "product" && TextAt(tags, "album") == nullptr)
+            tag.key = "album";
+}
+
+/// FFmpeg gives a text that has a language twice, as "KEY-eng" too.
+void DropCopies(std::vector<Tag>& tags) {
+    constexpr std::size_t kSuffix = 4;
+    const auto isCopy = [all = tags](const Tag& tag) {
+        if (tag.key.size() <= kSuffix || tag.key[tag.key.size() - kSuffix] != '-')
+            return false;
+        const Tag* const plain = TextAt(all, tag.key.substr(0, tag.key.size() - kSuffix));
+        return plain != nullptr && plain->value == tag.value;
+    };
+    RemoveIf(tags, isCopy);
+}
+
 } // namespace
 
 void PutTextsRight(std::string_view container, SourceInfo& info) {
     if (container == "ogg")
         TakeTextsOfStreams(info);
+    if (container == "avi" || container == "wav")
+        UseUsualNames(info.tags);
+    DropCopies(info.tags);
+    for (StreamInfo& stream : info.streams)
+        DropCopies(stream.tags);
+    for (Chapter& chapter : info.chapters)
+        DropCopies(chapter.tags);
 }
 
 } // namespace movieconv

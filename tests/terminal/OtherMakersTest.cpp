@@ -191,6 +191,35 @@ TEST(OtherMakers, TextsOfOggAreTheMovies) {
     }
 }
 
+/// A text that FFmpeg reads twice, and names of AVI's own.
+TEST(OtherMakers, TextsComeOnceAndUnderTheirUsualNames) {
+    const Folder folder;
+    const struct {
+        const char* name;
+        const char* key;
+        const char* value;
+        const char* other; ///< What is not there.
+    } cases[] = {{"a.mp4", "location", "+48.1000+011.5000/", "location-eng"},
+                 {"a.avi", "album", "Songs", "product"}};
+    for (const auto& test : cases) {
+        SCOPED_TRACE(test.name);
+        ASSERT_EQ(program::Run(Join(Args{"ffmpeg", "-v", "error"}, CountedPictures(1),
+                                    Args{"-c:v", "mpeg4", "-metadata",
+                                         std::string(test.key) + "=" + test.value, folder / test.name}))
+                      .code,
+                  0);
+        const std::string same = folder / (std::string("same-") + test.name);
+        for (const std::string& to : {same, folder / "out.mkv"}) {
+            EXPECT_EQ(Call({folder / test.name, to, "-y", "--progress", "none"}).err, "");
+            const Json info = Json::parse(Call({"--info", to, "--progress", "json"}).out);
+            std::string told = info["tags"].dump();
+            std::transform(told.begin(), told.end(), told.begin(), ::tolower);
+            EXPECT_TRUE(Has(told, std::string("\"") + test.key + "\"")) << told;
+            EXPECT_FALSE(Has(told, test.other) || Has(told, "software")) << told;
+        }
+    }
+}
+
 /// Chapters, texts and an attached file, as mkvmerge writes them from what people give it.
 void MakeNoted(const Folder& folder) {
     constexpr char kXml[] = "<?xml version=\"1.0\"?>";
