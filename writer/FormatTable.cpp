@@ -143,19 +143,19 @@ constexpr std::array kContainers{
               {kXvid, kH264, kHevc, kMjpg, kMpeg2}, {kAac, kMp3, kAc3, kAlac, kPcm}},
     Container{FourCC("MKV "), "Matroska", "mkv", "matroska", kStreamed, kClusters,
               kTags | kChapters | kCover | kCoverText | kFiles | kTracks | kLanguages | kTitles | kTimecode, kAnyTags, kMatroskaFlags,
-              kMatroskaSubtitles, kMatroskaSound, kLanguageTags,
+              kMatroskaSubtitles, kMatroskaSound, kLanguageTags | kTrackTexts,
               {kXvid, kH264, kHevc, kMjpg, kVp8, kVp9, kMpeg2, kFlv1, kAv1, kFfv1},
               {kAac, kMp3, kAc3, kFlac, kOpus, kVorbis, kAlac, kMp2, kPcm}},
     Container{FourCC("MKA "), "Matroska audio", "mka", "matroska", kStreamed, kClusters,
               kTags | kChapters | kCover | kCoverText | kFiles | kTracks | kLanguages | kTitles, kAnyTags, kMatroskaFlags,
-              kMatroskaSubtitles, kMatroskaSound, kLanguageTags,
+              kMatroskaSubtitles, kMatroskaSound, kLanguageTags | kTrackTexts,
               {},
               {kAac, kMp3, kAc3, kFlac, kOpus, kVorbis, kAlac, kMp2, kPcm}},
     Container{FourCC("AVI "), "AVI (Audio Video Interleaved)", "avi,divx", "avi", kSteadyRate, nullptr,
               kTags | kTracks | kTitles, kRiffTags, kNoFlags, nullptr, kAviSound, 0,
               {kXvid, kH264, kMjpg, kVp8, kMpeg2, kFlv1}, {kMp3, kAac, kAc3, kPcm}},
     Container{FourCC("WEBM"), "WebM", "webm", "webm", kStreamed, kClusters,
-              kTags | kChapters | kTracks | kLanguages | kTitles | kTimecode, kAnyTags, AV_DISPOSITION_FORCED, "webvtt", "vorbis,opus", kLanguageTags,
+              kTags | kChapters | kTracks | kLanguages | kTitles | kTimecode, kAnyTags, AV_DISPOSITION_FORCED, "webvtt", "vorbis,opus", kLanguageTags | kTrackTexts,
               {kVp8, kVp9, kAv1}, {kVorbis, kOpus}},
     Container{FourCC("FLV "), "Flash Video", "flv", "flv", kStreamed, nullptr,
               kTags, kAnyTags, kNoFlags, nullptr, "aac,mp3", kShortTags, {kH264, kFlv1}, {kAac, kMp3}},
@@ -356,7 +356,9 @@ bool CarriesTrackTag(const Container& container, const std::string& key, const s
         return (container.carries & kTitles) != 0;
     if (key == "language_tag")
         return (container.ways & kLanguageTags) != 0;
-    if (key != "language" || (container.carries & kLanguages) == 0)
+    if (key != "language")
+        return (container.ways & kTrackTexts) != 0;
+    if ((container.carries & kLanguages) == 0)
         return false;
     constexpr size_t kLetters = 3;
     return container.tags == nullptr ||

@@ -93,7 +93,8 @@ enum ContainerWays : uint32_t {
     kOneComment = 2,   ///< The comment and the description are one text.
     kLanguageTags = 4, ///< Languages can have a region or a script.
     kShortTags = 8,    ///< A text about the movie has 65535 bytes at most.
-    kTinyTags = 16     ///< It has 255 bytes at most.
+    kTinyTags = 16,    ///< It has 255 bytes at most.
+    kTrackTexts = 32   ///< Any text about a track is written.
 };
 
 /// A file format.

@@ -305,14 +305,21 @@ std::vector<int> StreamsBeside(const SourceInfo& source, const Chosen& chosen, c
     return beside;
 }
 
-/// What FFmpeg does not read of chapters, and so no output holds.
-void AddUnreadChapters(const SourceInfo& source, const Request& request, std::vector<NotCarried>& left) {
+/// What no output holds of chapters: what FFmpeg does not read, and what has no place in the movie.
+void AddLostChapters(const SourceInfo& source, const Request& request, std::vector<NotCarried>& left) {
+    if (request.noChapters)
+        return;
+    const auto tell = [&](std::string reason) {
+        left.push_back({"chapters", std::nullopt, {}, {}, std::move(reason)});
+    };
     const auto add = [&](int count, const char* what) {
-        if (!request.noChapters && count > 0)
-            left.push_back({"chapters", std::nullopt, {}, {}, fmt::format("{} of them {}", count, what)});
+        if (count > 0)
+            tell(fmt::format("{} of them {}", count, what));
     };
     add(source.unreadChapters, "are in other editions or within others");
     add(source.furtherTitles, "have titles in further languages");
+    if (std::string names = FurtherChapterTexts(source); !names.empty() && !request.noMetadata)
+        tell(fmt::format("of their texts only the titles are carried, not {}", names));
 }
 
 /// Of the one cover that is carried.
@@ -339,7 +346,7 @@ std::vector<NotCarried> LostByFormat(const SourceInfo& source, const std::vector
     if (std::optional<NotCarried> chapters = WhyChaptersStay(source, request, format))
         left.push_back(*std::move(chapters));
     else
-        AddUnreadChapters(source, request, left);
+        AddLostChapters(source, request, left);
     if (std::optional<NotCarried> timecode = WhyTimecodeStays(source, request, format))
         left.push_back(*std::move(timecode));
     for (const int stream : beside)

@@ -9,10 +9,13 @@
 #include "writer/WriterStatus.h"
 
 #include <algorithm>
+#include <array>
 #include <cmath>
 #include <cstddef>
 #include <fmt/format.h>
+#include <iterator>
 #include <string>
+#include <string_view>
 #include <utility>
 
 namespace movieconv {
@@ -67,6 +70,21 @@ std::vector<std::pair<const StreamInfo*, int>> EnginesTracks(const SourceInfo& s
     if (source.sound && !request.noAudio && !request.copySound && format.bHasAudio != 0)
         add(source.sound->index, kWriterTrackSound);
     return tracks;
+}
+
+/// What people wrote about a track beside its title: not what describes its pictures, or when a file was
+/// made.
+std::vector<Tag> TextsOf(const StreamInfo& stream, const Request& request) {
+    constexpr std::array<std::string_view, 4> kOthers{"creation_time", "alpha_mode", "stereo_mode",
+                                                      "language_tag"};
+    std::vector<Tag> texts;
+    if (!request.noMetadata)
+        std::copy_if(stream.tags.begin(), stream.tags.end(), std::back_inserter(texts), [&](const Tag& tag) {
+            return !tag.value.empty() && !IsTimecode(tag.key) &&
+                   std::none_of(kOthers.begin(), kOthers.end(),
+                                [&](std::string_view other) { return SameIgnoringCase(tag.key, other); });
+        });
+    return texts;
 }
 
 /// The stream's language by a code that the format can hold; empty when there is none.
@@ -134,6 +152,9 @@ void LabelTrack(const StreamInfo& stream, const Request& request, const FileForm
 std::optional<NotCarried> LostLabel(const StreamInfo& stream, const Request& request,
                                     const FileFormatInfo& format) {
     std::vector<std::string> missing;
+    for (const Tag& tag : TextsOf(stream, request))
+        if (MWCarriesTrackTag(format.fccFormat, tag.key.c_str(), tag.value.c_str()) != 0)
+            MWSetTrackTag(set, track, tag.key.c_str(), tag.value.c_str());
     if (!stream.language.empty() && LanguageIn(format, stream).empty())
         missing.emplace_back("language");
     else if (!stream.languageTag.empty() &&
@@ -151,6 +172,9 @@ std::optional<NotCarried> LostLabel(const StreamInfo& stream, const Request& req
                       stream.language,
                       fmt::format("{} cannot hold its {}", ShortName(format), Enumerate(missing))};
 }
+    for (const Tag& tag : TextsOf(stream, request))
+        if (MWCarriesTrackTag(format.fccFormat, tag.key.c_str(), tag.value.c_str()) == 0)
+            missing.push_back(tag.key);
 
 void CarryTexts(const SourceInfo& source, const Request& request, const FileFormatInfo& format,
                 uint32_t set) {
@@ -182,6 +206,15 @@ std::vector<NotCarried> LostTexts(const SourceInfo& source, const Request& reque
 int CarryChapters(const SourceInfo& source, const Request& request, const FileFormatInfo& format,
                   uint32_t set) {
     return HoldsChapterTexts(format) ? AddChapterTexts(source, request, set) : AddChapters(source, set);
+}
+
+std::string FurtherChapterTexts(const SourceInfo& source) {
+    std::vector<std::string> names;
+    for (const Chapter& chapter : source.chapters)
+        for (const Tag& tag : chapter.tags)
+            if (std::find(names.begin(), names.end(), tag.key) == names.end())
+                names.push_back(tag.key);
+    return Enumerate(names);
 }
 
 std::optional<NotCarried> WhyChaptersStay(const SourceInfo& source, const Request& request,

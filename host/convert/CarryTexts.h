@@ -10,6 +10,7 @@
 
 #include <cstdint>
 #include <optional>
+#include <string>
 #include <vector>
 
 namespace movieconv {
@@ -33,6 +34,9 @@ std::optional<NotCarried> LostLabel(const StreamInfo& stream, const Request& req
 /// they make no sense.
 int CarryChapters(const SourceInfo& source, const Request& request, const FileFormatInfo& format,
                   uint32_t set);
+
+/// What is said of chapters beside their titles: "artist and comment"; empty when nothing is.
+std::string FurtherChapterTexts(const SourceInfo& source);
 
 /// Nothing when there are none, none are wanted, or the format holds them.
 std::optional<NotCarried> WhyChaptersStay(const SourceInfo& source, const Request& request,

@@ -24,8 +24,9 @@ namespace {
 constexpr std::array<std::string_view, 13> kNotes{
     "encoder",  "major_brand", "minor_version", "compatible_brands", "handler_name", "vendor_id", "duration",
     "language", "filename",    "mimetype",      "variant_bitrate",   "id3v2_priv",   "rotate"};
-constexpr std::array<std::string_view, 4> kStatistics{"BPS", "NUMBER_OF_FRAMES", "NUMBER_OF_BYTES",
-                                                      "_STATISTICS_"};
+constexpr std::array<std::string_view, 7> kStatistics{
+    "BPS",       "NUMBER_OF_FRAMES", "NUMBER_OF_BYTES",  "_STATISTICS_",
+    "DURATION-", "SOURCE_ID",        "file_package_umid"};
 
 bool IsNote(const std::string& key) {
     const auto same = [&](std::string_view note) { return av_strcasecmp(key.c_str(), note.data()) == 0; };

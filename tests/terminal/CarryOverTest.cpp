@@ -113,6 +113,34 @@ TEST(CarryOver, KeepsCoversWithTheirNamesAndTitles) {
     EXPECT_EQ(covers(folder / "again.mka"), "codec_name=png|tag:filename=cover.png\n");
 }
 
+TEST(CarryOver, KeepsWhatIsSaidOfTracksAndTellsWhatIsSaidOfChapters) {
+    const Folder folder;
+    WriteFile(folder / "notes.txt", ";FFMETADATA1\n[CHAPTER]\nTIMEBASE=1/1000\nSTART=0\nEND=900\n"
+                                    "title=First\nMOOD=calm\n");
+    Ffmpeg(Join(CountedPictures(1), Beeps(1), Args{"-i", folder / "notes.txt"},
+                Words("-map 0 -map 1 -map 1 -map_chapters 2 -c:v mpeg4 -metadata:s:a:0 MIC=left "
+                      "-metadata:s:a:1 MIC=right -metadata:s:a:1 SOURCE_ID=7"),
+                Args{folder / "in.mkv"}));
+    const std::string ofChapters = "movieconv: not carried: chapters: of their texts only the titles are "
+                                   "carried, not MOOD\n";
+    const auto told = [&](const char* name, const Args& options) {
+        return Call(Join(Args{folder / "in.mkv", folder / name, "-y", "--progress", "none"}, options)).err;
+    };
+    const auto tracks = [&](const char* name) {
+        return test_movies::Ffprobe(
+            folder / name, Words("-show_entries stream_tags=MIC,SOURCE_ID -of csv=p=0 -select_streams a"));
+    };
+    for (const char* name : {"out.mkv", "out.webm"}) {
+        EXPECT_EQ(told(name, {}), ofChapters);
+        EXPECT_EQ(tracks(name), "left\nright\n");
+    }
+    EXPECT_EQ(told("out.mp4", {}), "movieconv: not carried: label 1 (vorbis): MP4 cannot hold its MIC\n" +
+                                       ofChapters +
+                                       "movieconv: not carried: label 2 (vorbis): MP4 cannot hold its MIC\n");
+    EXPECT_EQ(told("out.mkv", {"--no-metadata"}), "");
+    EXPECT_EQ(tracks("out.mkv"), "\n\n");
+}
+
 TEST(CarryOver, MovesChaptersWithTheRange) {
     const Folder folder;
     const std::string whole = MakeWhole(folder);

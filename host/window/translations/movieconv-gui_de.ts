@@ -598,6 +598,10 @@
         <translation>%1 davon haben Titel in weiteren Sprachen</translation>
     </message>
     <message>
+        <source>of their texts only the titles are carried, not %1</source>
+        <translation>von ihren Texten gehen nur die Titel mit, nicht aber: %1</translation>
+    </message>
+    <message>
         <source>timecode</source>
         <translation>Zeitcode</translation>
     </message>
