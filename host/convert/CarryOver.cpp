@@ -18,13 +18,10 @@
 #include <new>
 #include <optional>
 #include <string>
-#include <string_view>
 #include <utility>
 
 namespace movieconv {
 namespace {
-
-constexpr std::string_view kChapterTrack = "bin_data"; // MP4 holds the chapters once more, as texts
 
 constexpr int64_t kLargestCoverInFlac = 16'000'000; // with its description below 2^24
 
@@ -236,9 +233,8 @@ std::string WhyItStays(const SourceInfo& source, const Chosen& chosen, const Str
     case StreamKind::kSubtitles:
         return WhySubtitlesStay(stream, format);
     case StreamKind::kData:
-        return (stream.codec == kChapterTrack && !source.chapters.empty()) || HoldsTheTimecode(source, stream)
-                   ? ""
-                   : "data streams are not converted";
+        return stream.holdsChapters || HoldsTheTimecode(source, stream) ? ""
+                                                                        : "data streams are not converted";
     case StreamKind::kCover:
         if ((traits & kWriterFormatCover) == 0)
             return fmt::format("{} cannot hold it", ShortName(format));

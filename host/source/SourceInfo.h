@@ -132,8 +132,9 @@ struct StreamInfo {
 
     std::optional<PictureStreamInfo> pictures; ///< Of pictures and covers.
     std::optional<SoundStreamInfo> sound;
-    bool textual = false; ///< Subtitles made of text, not of bitmaps.
-    std::string fileName; ///< Of attachments and covers.
+    bool textual = false;       ///< Subtitles made of text, not of bitmaps.
+    bool holdsChapters = false; ///< Data that are the chapters once more, as texts.
+    std::string fileName;       ///< Of attachments and covers.
     std::string mimeType;
     int64_t bytes = 0; ///< Size of attachments and covers.
 };

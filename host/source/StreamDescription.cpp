@@ -221,6 +221,13 @@ StreamFlags FlagsOf(const AVStream* stream) {
             has(AV_DISPOSITION_VISUAL_IMPAIRED)};
 }
 
+/// Texts become data when FFmpeg has read the chapters in them; other data of MP4 have tags of their own.
+bool IsChapterTrack(const AVCodecParameters& parameters) {
+    return parameters.codec_id == AV_CODEC_ID_BIN_DATA &&
+           (parameters.codec_tag == MKTAG('t', 'e', 'x', 't') ||
+            parameters.codec_tag == MKTAG('t', 'x', '3', 'g'));
+}
+
 /// A stamp in seconds from `start`.
 double SecondsFrom(int64_t start, int64_t stamp, AVRational timeBase) {
     return ToSeconds(av_sat_sub64(av_rescale_q(stamp, timeBase, {1, kTicksPerSecond}), start));
@@ -253,6 +260,7 @@ StreamInfo DescribeStream(AVFormatContext& context, AVStream* stream, int64_t st
                  : info.kind == StreamKind::kAttachment ? parameters.extradata_size
                                                         : 0;
     const AVCodecDescriptor* codec = avcodec_descriptor_get(parameters.codec_id);
+    info.holdsChapters = IsChapterTrack(parameters);
     info.textual = codec != nullptr && (codec->props & AV_CODEC_PROP_TEXT_SUB) != 0;
     if (parameters.codec_type == AVMEDIA_TYPE_VIDEO) {
         info.pictures = DescribePictures(context, stream);

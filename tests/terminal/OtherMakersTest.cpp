@@ -220,6 +220,26 @@ TEST(OtherMakers, TextsComeOnceAndUnderTheirUsualNames) {
     }
 }
 
+/// Beside chapters in a track of texts, which is data for FFmpeg as well.
+TEST(OtherMakers, DataBesideChaptersAreTold) {
+    const Folder folder;
+    WriteFile(folder / "a.srt", "1\n00:00:00,200 --> 00:00:00,600\nA\n");
+    WriteFile(folder / "notes.txt", ";FFMETADATA1\n[CHAPTER]\nTIMEBASE=1/1000\nSTART=0\nEND=900\ntitle=A\n");
+    ASSERT_EQ(program::Run(Join(Args{"ffmpeg", "-v", "error"}, CountedPictures(1),
+                                Args{"-i", folder / "a.srt", "-i", folder / "notes.txt", "-c:v", "mpeg4",
+                                     "-c:s", "mov_text", folder / "a.mp4"}))
+                  .code,
+              0);
+    std::string movie = ReadFile(folder / "a.mp4");
+    for (const auto& [from, to] : {std::pair("sbtl", "meta"), std::pair("tx3g", "gpmd")}) {
+        ASSERT_NE(movie.find(from), std::string::npos);
+        movie.replace(movie.find(from), 4, to);
+    }
+    WriteFile(folder / "a.mp4", movie);
+    EXPECT_EQ(Call({folder / "a.mp4", folder / "out.mkv", "--progress", "none"}).err,
+              "movieconv: not carried: data 1 (bin_data): data streams are not converted\n");
+}
+
 /// Chapters, texts and an attached file, as mkvmerge writes them from what people give it.
 void MakeNoted(const Folder& folder) {
     constexpr char kXml[] = "<?xml version=\"1.0\"?>";
