@@ -120,7 +120,8 @@ constexpr const char* kNoTags = "";
 constexpr int kNoFlags = 0;
 constexpr int kSenses = AV_DISPOSITION_HEARING_IMPAIRED | AV_DISPOSITION_VISUAL_IMPAIRED;
 constexpr int kMp4Flags = AV_DISPOSITION_FORCED | AV_DISPOSITION_COMMENT | AV_DISPOSITION_DUB | kSenses;
-constexpr int kMatroskaFlags = AV_DISPOSITION_FORCED | AV_DISPOSITION_COMMENT | AV_DISPOSITION_ORIGINAL | kSenses;
+constexpr int kMatroskaFlags = AV_DISPOSITION_FORCED | AV_DISPOSITION_COMMENT | AV_DISPOSITION_ORIGINAL |
+                               AV_DISPOSITION_DUB | kSenses;
 constexpr const char* kMp4Subtitles = "mov_text";
 constexpr const char* kMatroskaSubtitles = "subrip,ass,ssa,text,webvtt,hdmv_pgs_subtitle,hdmv_text_subtitle,"
                                            "dvd_subtitle,dvb_subtitle";

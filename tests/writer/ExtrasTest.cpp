@@ -37,6 +37,7 @@ struct ReadChapter {
 struct ReadExtras {
     std::map<std::string, std::string> tags;
     std::string soundLanguage;
+    int soundFlags = 0;
     std::vector<ReadChapter> chapters;
     std::string cover;
     std::string coverText;
@@ -62,6 +63,7 @@ ReadExtras ReadExtrasOf(const std::string& path) {
         const AVStream& stream = *context->streams[i];
         const AVCodecParameters& parameters = *stream.codecpar;
         if (parameters.codec_type == AVMEDIA_TYPE_AUDIO) {
+            read.soundFlags = stream.disposition;
             read.soundLanguage = Value(stream.metadata, "language");
             while ((entry = av_dict_get(stream.metadata, "", entry, AV_DICT_IGNORE_SUFFIX)) != nullptr)
                 read.tags.emplace(entry->key, entry->value);
@@ -169,6 +171,24 @@ TEST_F(Extras, ChaptersFollowTheSourceIntoAClip) {
         EXPECT_NEAR(read.chapters[0].end, 0.3, 0.0011);
         EXPECT_EQ(read.chapters[0].title, "Zwei – ü");
         EXPECT_NEAR(read.chapters[1].end, 1.0, 0.0011);
+    }
+}
+
+TEST_F(Extras, FlagsOfSoundAreWhereTheTableHasThem) {
+    for (const FileFormatInfo* format = MWGetFileFormatInfos(); format->fccFormat != 0; ++format) {
+        Choose(*format);
+        movie_.hasVideo = false;
+        for (const int flag :
+             {AV_DISPOSITION_FORCED, AV_DISPOSITION_ORIGINAL, AV_DISPOSITION_DUB, AV_DISPOSITION_COMMENT,
+              AV_DISPOSITION_HEARING_IMPAIRED, AV_DISPOSITION_VISUAL_IMPAIRED}) {
+            if (format->bHasAudio == 0)
+                continue;
+            SCOPED_TRACE(format->szName + std::string(" ") + av_disposition_to_string(flag));
+            ASSERT_EQ(MWSetTrackFlags(registered_.Set(), kWriterTrackSound, flag), 1);
+            ASSERT_TRUE(movie_.Write(path_)) << Latest(registered_.Set()).szWhat;
+            const bool isHeld = (MWCarriedTrackFlags(format->fccFormat) & flag) != 0;
+            EXPECT_EQ((ReadExtrasOf(path_).soundFlags & flag) != 0, isHeld);
+        }
     }
 }
 
