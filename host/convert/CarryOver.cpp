@@ -172,8 +172,8 @@ std::string WhySoundStays(const SourceInfo& source, const StreamInfo& stream, co
     return {};
 }
 
-/// Hands a cover or an attachment that the format can hold to the writer; a cover after the first one is a
-/// file among others. Empty when it was taken.
+/// Hands a cover or an attachment that the format can hold to the writer; a cover after the first one, or of
+/// another kind, is a file among others. Empty when it was taken.
 std::string CarryStored(const Movie& movie, const StreamInfo& stream, const Request& request,
                         const FileFormatInfo& format, uint32_t set, bool& hasCover) {
     if (stream.kind != StreamKind::kCover && stream.kind != StreamKind::kAttachment)
@@ -188,7 +188,8 @@ std::string CarryStored(const Movie& movie, const StreamInfo& stream, const Requ
         hasCover = MWSetCover(set, data.data(), size) != 0;
         if (hasCover)
             MWDescribeCover(set, stream.fileName.c_str(), title);
-        return hasCover ? "" : "it is neither JPEG nor PNG";
+        if (hasCover || !holdsFiles)
+            return hasCover ? "" : "it is neither JPEG nor PNG";
     }
     const bool unnamed = stream.kind == StreamKind::kCover && stream.fileName.empty();
     const std::string type = stream.codec == "mjpeg" ? "jpeg" : stream.codec;

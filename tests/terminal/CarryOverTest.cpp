@@ -113,6 +113,17 @@ TEST(CarryOver, KeepsCoversWithTheirNamesAndTitles) {
     EXPECT_EQ(covers(folder / "again.mka"), "codec_name=png|tag:filename=cover.png\n");
 }
 
+TEST(CarryOver, TakesACoverOfAnotherKindForAFile) {
+    const Folder folder;
+    Ffmpeg(Join(CountedPictures(1), Args{"-frames:v", "1", folder / "front.gif"}));
+    Ffmpeg(Join(Beeps(1), Args{"-attach", folder / "front.gif"}, Words("-metadata:s:t mimetype=image/gif"),
+                Args{folder / "in.mka"}));
+    EXPECT_EQ(Call({folder / "in.mka", folder / "out.mka", "--progress", "none"}).err, "");
+    EXPECT_TRUE(Has(Probe(folder / "out.mka"), "codec_name=gif"));
+    EXPECT_TRUE(Has(Call({folder / "in.mka", folder / "out.mp3", "--progress", "none"}).err,
+                    "it is neither JPEG nor PNG"));
+}
+
 TEST(CarryOver, KeepsWhatIsSaidOfTracksAndTellsWhatIsSaidOfChapters) {
     const Folder folder;
     WriteFile(folder / "notes.txt", ";FFMETADATA1\n[CHAPTER]\nTIMEBASE=1/1000\nSTART=0\nEND=900\n"
