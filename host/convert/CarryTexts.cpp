@@ -99,12 +99,18 @@ std::string LanguageIn(const FileFormatInfo& format, const StreamInfo& stream) {
     return {};
 }
 
+/// No file gets a chapter of less than a millisecond.
+bool HasLength(const Chapter& chapter) {
+    return Ticks(chapter.end) - Ticks(chapter.begin) >= kTicksPerSecond / 1000;
+}
+
 /// How many chapters were left out, because they make no sense.
 int AddChapters(const SourceInfo& source, uint32_t set) {
     int left = 0;
     for (const Chapter& chapter : source.chapters)
-        left +=
-            MWAddChapter(set, Ticks(chapter.begin), Ticks(chapter.end), chapter.title.c_str()) != 0 ? 0 : 1;
+        if (!HasLength(chapter) ||
+            MWAddChapter(set, Ticks(chapter.begin), Ticks(chapter.end), chapter.title.c_str()) == 0)
+            ++left;
     return left;
 }
 
@@ -121,7 +127,7 @@ int AddChapterTexts(const SourceInfo& source, const Request& request, uint32_t s
     for (const Chapter& chapter : source.chapters) {
         const double begin = std::max(chapter.begin - request.begin, 0.0);
         const bool isThere = chapter.end > request.begin && (!request.length || begin < *request.length);
-        if (chapter.end <= chapter.begin || (isThere && number == kMost)) {
+        if (!HasLength(chapter) || (isThere && number == kMost)) {
             ++left;
         } else if (isThere) {
             const auto milliseconds = std::llround(begin * 1000);

@@ -153,6 +153,7 @@ TEST_F(Extras, ChaptersFollowTheSourceIntoAClip) {
     Fill(registered_.Set());
     for (const char* code : {"MP4 ", "MKV "}) {
         SCOPED_TRACE(code);
+        ASSERT_EQ(MWAddChapter(registered_.Set(), kSecond, 12 * kSecond / 10 + 1, "too short"), 1);
         movie_.param.fccFileFormat = FourCC(code[0], code[1], code[2], code[3]);
         void* file = movie_.Create(path_);
         ASSERT_NE(file, nullptr);
