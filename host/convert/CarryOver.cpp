@@ -314,6 +314,8 @@ void AddLostChapters(const SourceInfo& source, const Request& request, std::vect
             tell(fmt::format("{} of them {}", count, what));
     };
     add(source.unreadChapters, "are in other editions or within others");
+    add(source.disorderedChapters, "are out of their order in time");
+    add(ChaptersOutside(source), "lie outside the movie");
     add(source.furtherTitles, "have titles in further languages");
     if (std::string names = FurtherChapterTexts(source); !names.empty() && !request.noMetadata)
         tell(fmt::format("of their texts only the titles are carried, not {}", names));

@@ -152,15 +152,15 @@ void LabelTrack(const StreamInfo& stream, const Request& request, const FileForm
         MWSetTrackTag(set, track, "language_tag", stream.languageTag.c_str());
     if (!request.noMetadata && !stream.title.empty())
         MWSetTrackTag(set, track, "title", stream.title.c_str());
+    for (const Tag& tag : TextsOf(stream, request))
+        if (MWCarriesTrackTag(format.fccFormat, tag.key.c_str(), tag.value.c_str()) != 0)
+            MWSetTrackTag(set, track, tag.key.c_str(), tag.value.c_str());
     MWSetTrackFlags(set, track, Dispositions(stream.flags));
 }
 
 std::optional<NotCarried> LostLabel(const StreamInfo& stream, const Request& request,
                                     const FileFormatInfo& format) {
     std::vector<std::string> missing;
-    for (const Tag& tag : TextsOf(stream, request))
-        if (MWCarriesTrackTag(format.fccFormat, tag.key.c_str(), tag.value.c_str()) != 0)
-            MWSetTrackTag(set, track, tag.key.c_str(), tag.value.c_str());
     if (!stream.language.empty() && LanguageIn(format, stream).empty())
         missing.emplace_back("language");
     else if (!stream.languageTag.empty() &&
@@ -172,15 +172,15 @@ std::optional<NotCarried> LostLabel(const StreamInfo& stream, const Request& req
     const int carried = MWCarriedTrackFlags(format.fccFormat) | AV_DISPOSITION_DEFAULT;
     if ((Dispositions(stream.flags) & ~carried) != 0)
         missing.emplace_back("flags");
+    for (const Tag& tag : TextsOf(stream, request))
+        if (MWCarriesTrackTag(format.fccFormat, tag.key.c_str(), tag.value.c_str()) == 0)
+            missing.push_back(tag.key);
     if (missing.empty())
         return std::nullopt;
     return NotCarried{"label", stream.index >= 0 ? std::optional(stream.index) : std::nullopt, stream.codec,
                       stream.language,
                       fmt::format("{} cannot hold its {}", ShortName(format), Enumerate(missing))};
 }
-    for (const Tag& tag : TextsOf(stream, request))
-        if (MWCarriesTrackTag(format.fccFormat, tag.key.c_str(), tag.value.c_str()) == 0)
-            missing.push_back(tag.key);
 
 void CarryTexts(const SourceInfo& source, const Request& request, const FileFormatInfo& format,
                 uint32_t set) {
@@ -212,6 +212,14 @@ std::vector<NotCarried> LostTexts(const SourceInfo& source, const Request& reque
 int CarryChapters(const SourceInfo& source, const Request& request, const FileFormatInfo& format,
                   uint32_t set) {
     return HoldsChapterTexts(format) ? AddChapterTexts(source, request, set) : AddChapters(source, set);
+}
+
+int ChaptersOutside(const SourceInfo& source) {
+    const double end = source.certainty == Certainty::kKnown ? source.duration : HUGE_VAL;
+    return static_cast<int>(
+        std::count_if(source.chapters.begin(), source.chapters.end(), [&](const Chapter& chapter) {
+            return HasLength(chapter) && (chapter.end <= 0 || chapter.begin >= end);
+        }));
 }
 
 std::string FurtherChapterTexts(const SourceInfo& source) {

@@ -35,6 +35,9 @@ std::optional<NotCarried> LostLabel(const StreamInfo& stream, const Request& req
 int CarryChapters(const SourceInfo& source, const Request& request, const FileFormatInfo& format,
                   uint32_t set);
 
+/// How many chapters lie in front of the movie or behind its end, as far as that is known.
+int ChaptersOutside(const SourceInfo& source);
+
 /// What is said of chapters beside their titles: "artist and comment"; empty when nothing is.
 std::string FurtherChapterTexts(const SourceInfo& source);
 

@@ -32,6 +32,7 @@ struct ContainerNotes {
     std::vector<Tag> repeated;  ///< Texts that are there several times: all of them, ";" in between.
     std::vector<File> files;    ///< Attached ones that are described.
     int chapters = 0;           ///< All there are, of every edition and within each other.
+    int disordered = 0;         ///< Of the first edition, those that begin before one in front of them.
     std::vector<Titles> titles; ///< Of each chapter that has several, in several languages.
 };
 

@@ -27,6 +27,7 @@ constexpr uint64_t kTrackLanguage = 0x22B59D;
 constexpr uint64_t kChapters = 0x1043A770;
 constexpr uint64_t kEdition = 0x45B9;
 constexpr uint64_t kChapter = 0xB6;
+constexpr uint64_t kChapterBegin = 0x91;
 constexpr uint64_t kChapterDisplay = 0x80;
 constexpr uint64_t kChapterTitle = 0x85;
 constexpr uint64_t kAttachments = 0x1941A469;
@@ -56,7 +57,11 @@ public:
     ContainerNotes Read() {
         notes_.title = Text(Locate(kInfo), kTitle, kLongestName);
         ReadTracks();
-        ForEach(Locate(kChapters), kEdition, [this](const Part& edition) { ReadChapters(edition, 0); });
+        ForEach(Locate(kChapters), kEdition, [this](const Part& edition) {
+            if (notes_.chapters == 0)
+                CountDisordered(edition);
+            ReadChapters(edition, 0);
+        });
         ForEach(Locate(kAttachments), kFile, [this](const Part& file) {
             if (std::string description = Text(file, kFileDescription, kLongestText); !description.empty())
                 notes_.files.push_back({Text(file, kFileName, kLongestName), std::move(description)});
@@ -117,6 +122,16 @@ private:
             if (depth == 0)
                 ReadTitles(chapter);
             ReadChapters(chapter, depth + 1);
+        });
+    }
+
+    /// FFmpeg leaves out what does not begin behind all it has read.
+    void CountDisordered(const Part& edition) {
+        uint64_t latest = 0;
+        ForEach(edition, kChapter, [&](const Part& chapter) {
+            const uint64_t begin = elements_.Number(elements_.Find(chapter, kChapterBegin));
+            notes_.disordered += latest != 0 && begin <= latest ? 1 : 0;
+            latest = std::max(latest, begin);
         });
     }
 

@@ -81,7 +81,9 @@ void TakeNotes(const ContainerNotes& notes, SourceInfo& info) {
     DescribeFiles(notes.files, info.streams);
     PreferFirstTitles(notes.titles, info.chapters);
     info.furtherTitles = static_cast<int>(notes.titles.size());
-    info.unreadChapters = std::max(notes.chapters - static_cast<int>(info.chapters.size()), 0);
+    const int unread = std::max(notes.chapters - static_cast<int>(info.chapters.size()), 0);
+    info.disorderedChapters = std::min(notes.disordered, unread);
+    info.unreadChapters = unread - info.disorderedChapters;
 }
 
 } // namespace
@@ -99,9 +101,9 @@ Source::Source(const std::string& path, const SourceChoice& choice,
     info_.chapters = DescribeChapters(context, reader_.Start());
     info_.tags = DescribeTags(context.metadata);
     TakeNotes(reader_.File().Notes(), info_);
+    PutTextsRight(context.iformat->name, info_);
     const ChosenStreams chosen = ChooseStreams(info_.streams, choice);
     WantedTracks(info_.streams, StreamKind::kSubtitles, choice.subtitles); // throws
-    PutTextsRight(context.iformat->name, info_);
     std::vector<int> selected;
     if (chosen.pictures >= 0) {
         selected.push_back(chosen.pictures);

@@ -154,9 +154,10 @@ struct SourceInfo {
     Certainty certainty = Certainty::kKnown; ///< Of `duration`.
     std::vector<StreamInfo> streams;         ///< All of them, in the container's order.
     std::vector<Chapter> chapters;
-    int unreadChapters = 0; ///< Others, of further editions or within these.
-    int furtherTitles = 0;  ///< Chapters with titles in further languages, which are none of the above.
-    std::vector<Tag> tags;  ///< What people wrote about the movie.
+    int unreadChapters = 0;     ///< Others, of further editions or within these.
+    int disorderedChapters = 0; ///< Others that stand behind later ones.
+    int furtherTitles = 0;      ///< Chapters with titles in further languages, which are none of the above.
+    std::vector<Tag> tags;      ///< What people wrote about the movie.
 
     std::optional<PictureStreamInfo> pictures; ///< The stream that is converted, probed.
     std::optional<SoundStreamInfo> sound;

@@ -240,6 +240,24 @@ TEST(OtherMakers, DataBesideChaptersAreTold) {
               "movieconv: not carried: data 1 (bin_data): data streams are not converted\n");
 }
 
+TEST(OtherMakers, ChaptersOutOfOrderAndOutsideAreTold) {
+    const Folder folder;
+    const auto chapter = [](const char* begin, const char* end) {
+        return std::string("[CHAPTER]\nTIMEBASE=1/1000\nSTART=") + begin + "\nEND=" + end + "\ntitle=A\n";
+    };
+    WriteFile(folder / "notes.txt", ";FFMETADATA1\n" + chapter("0", "400") + chapter("600", "2000") +
+                                        chapter("300", "500") + chapter("3000", "4000"));
+    ASSERT_EQ(program::Run(Join(Args{"ffmpeg", "-v", "error"}, CountedPictures(1),
+                                Args{"-i", folder / "notes.txt", "-c:v", "mpeg4", folder / "a.mkv"}))
+                  .code,
+              0);
+    EXPECT_EQ(Call({folder / "a.mkv", folder / "out.mkv", "--progress", "none"}).err,
+              "movieconv: not carried: chapters: 1 of them are out of their order in time\n"
+              "movieconv: not carried: chapters: 1 of them lie outside the movie\n");
+    EXPECT_EQ(Call({folder / "a.mkv", folder / "out.mkv", "-y", "--progress", "none", "--no-chapters"}).err,
+              "");
+}
+
 /// Chapters, texts and an attached file, as mkvmerge writes them from what people give it.
 void MakeNoted(const Folder& folder) {
     constexpr char kXml[] = "<?xml version=\"1.0\"?>";

@@ -31,6 +31,8 @@ constexpr const char* kSentences[] = {
     QT_TRANSLATE_NOOP("Library", "%1 of their texts could not be converted"),
     QT_TRANSLATE_NOOP("Library", "%1 of them are in other editions or within others"),
     QT_TRANSLATE_NOOP("Library", "%1 of them have titles in further languages"),
+    QT_TRANSLATE_NOOP("Library", "%1 of them are out of their order in time"),
+    QT_TRANSLATE_NOOP("Library", "%1 of them lie outside the movie"),
     QT_TRANSLATE_NOOP("Library", "of their texts only the titles are carried, not %1"),
 
     // Why a conversion is refused.

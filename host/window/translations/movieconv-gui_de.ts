@@ -598,6 +598,14 @@
         <translation>%1 davon haben Titel in weiteren Sprachen</translation>
     </message>
     <message>
+        <source>%1 of them are out of their order in time</source>
+        <translation>%1 davon stehen nicht in ihrer zeitlichen Reihenfolge</translation>
+    </message>
+    <message>
+        <source>%1 of them lie outside the movie</source>
+        <translation>%1 davon liegen außerhalb des Films</translation>
+    </message>
+    <message>
         <source>of their texts only the titles are carried, not %1</source>
         <translation>von ihren Texten gehen nur die Titel mit, nicht aber: %1</translation>
     </message>
