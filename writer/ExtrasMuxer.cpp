@@ -44,6 +44,17 @@ Tags TagsFor(const Container& container, Tags tags) {
     return tags;
 }
 
+/// MP4 has 16 bits for the length of a text; the multiplexer takes the rest of a longer one.
+std::string TitleFor(const Container& container, const Chapter& chapter) {
+    constexpr size_t kMost = 65535;
+    if (container.kind != ContainerKind::kFragmented || chapter.title.size() <= kMost)
+        return chapter.title;
+    size_t length = kMost;
+    while (length > 0 && (static_cast<unsigned char>(chapter.title[length]) & 0xC0) == 0x80)
+        --length; // the middle of a character
+    return chapter.title.substr(0, length);
+}
+
 /// Zeroed memory of FFmpeg's, for `count` objects.
 template <class Type>
 Type* New(size_t count = 1) {
@@ -156,7 +167,7 @@ void ExtrasMuxer::SetChapters(AVFormatContext& output, const std::vector<Chapter
         made->time_base = {1, kTicksPerSecond};
         made->start = chapter.begin;
         made->end = chapter.end;
-        SetTags(made->metadata, {{"title", chapter.title}});
+        SetTags(made->metadata, {{"title", TitleFor(container_, chapter)}});
     }
 }
 
