@@ -175,7 +175,7 @@ constexpr std::array kContainers{
     Container{FourCC("WAV "), "WAV (RIFF wave)", "wav", "wav", kSteadyRate, "rf64=auto",
               kTags, kRiffTags, kNoFlags, nullptr, kWavSound, 0, {}, {kPcm, kMp3, kAc3}},
     Container{FourCC("FLAC"), "FLAC", "flac", "flac", kStreamed, nullptr,
-              kTags | kCover | kCoverText, kAnyTags, kNoFlags, nullptr, "flac", kOneComment, {}, {kFlac}},
+              kTags | kCover | kCoverText | kChapterTexts, kAnyTags, kNoFlags, nullptr, "flac", kOneComment, {}, {kFlac}},
     Container{FourCC("OGG "), "Ogg", "ogg,oga,opus", "ogg", kStreamed, nullptr,
               kTags | kLanguages | kChapterTexts, kAnyTags, kNoFlags, nullptr, "vorbis,opus,flac,speex", kTagsInStream | kOneComment, {}, {kVorbis, kOpus, kFlac}},
 };

@@ -160,10 +160,12 @@ TEST(CarryOver, MovesChaptersWithTheRange) {
     const std::string read = Probe(folder / "out.mkv");
     EXPECT_TRUE(Has(read, "start_time=0.000000|end_time=0.600000|tag:title=First")) << read;
     EXPECT_TRUE(Has(read, "start_time=0.600000|end_time=1.2")) << read;
-    ASSERT_EQ(Call({whole, folder / "out.ogg", "--begin", "0.4", "--length", "1.2", "-q"}).code, 0);
-    const std::string texts = Probe(folder / "out.ogg");
-    EXPECT_TRUE(Has(texts, "start_time=0.000000|end_time=0.600000|tag:title=First")) << texts;
-    EXPECT_TRUE(Has(texts, "start_time=0.600000|")) << texts;
+    for (const char* name : {"out.ogg", "out.flac"}) {
+        ASSERT_EQ(Call({whole, folder / name, "--begin", "0.4", "--length", "1.2", "-q"}).code, 0);
+        const std::string texts = Probe(folder / name);
+        EXPECT_TRUE(Has(texts, "start_time=0.000000|end_time=0.600000|tag:title=First")) << texts;
+        EXPECT_TRUE(Has(texts, "start_time=0.600000|")) << texts;
+    }
     // What was carried is carried again, and MP4's own track of chapters is not told.
     const Result again = Call({folder / "out.mkv", folder / "again.mp4", "--progress", "none"});
     const Result third = Call({folder / "again.mp4", folder / "third.mp4", "--progress", "none"});

@@ -58,7 +58,7 @@ const Room kRooms[] = {
     {"ts", {}, "", "dvb_subtitle", false, true, false, false},
     {"flv", {}, "", "", false, false, false, false},
     {"mp3", {}, "", "", false, false, true, false},
-    {"flac", {}, "", "", false, false, true, false},
+    {"flac", {}, "", "", true, false, true, false},
     {"ogg", {}, "", "", true, false, false, false},
     {"wav", {}, "", "", false, false, false, false},
     {"mpg", {}, "", "", false, false, false, false},
