@@ -5,12 +5,16 @@
 
 #include <algorithm>
 #include <array>
+#include <cstddef>
 #include <cstring>
 #include <optional>
 #include <utility>
 
 namespace writer {
 namespace {
+
+/// Size of the record in its first version.
+constexpr size_t kLeastTrack = offsetof(WriterTrack, pContext) + sizeof(WriterTrack::pContext);
 
 struct Size {
     int width;
@@ -67,7 +71,7 @@ TrackLabel* FindLabel(Extras& extras, int track) {
 }
 
 bool AddTrack(Extras& extras, const WriterTrack* track) {
-    if (track == nullptr || track->nSize < sizeof *track || track->pfnNext == nullptr)
+    if (track == nullptr || track->nSize < kLeastTrack || track->pfnNext == nullptr)
         return false;
     const bool isSound = track->nSampleRate > 0 && track->nChannels > 0 && track->nBitsPerSample > 0;
     if (isSound == (track->pParameters != nullptr))
@@ -77,6 +81,7 @@ bool AddTrack(Extras& extras, const WriterTrack* track) {
                track->nChannels,
                track->nBitsPerSample,
                track->nBitrate,
+               track->nSize < sizeof *track ? 0 : track->nChannelMask,
                {},
                track->pfnNext,
                track->pContext,

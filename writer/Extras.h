@@ -58,6 +58,7 @@ struct Track {
     int channels = 0;
     int bitsPerSample = 0;
     int64_t bitrate = 0;
+    uint64_t speakers = 0;                         ///< As in WriterOptions::nChannelMask.
     std::shared_ptr<AVCodecParameters> parameters; ///< Of packets.
     WriterTrackReader next = nullptr;
     void* context = nullptr;

@@ -181,7 +181,8 @@ PicturePlan MakePicturePlan(const EncodeParam& param, const VideoFormat& source,
     return plan;
 }
 
-SoundPlan MakeSoundPlan(const EncodeParam& param, const AudioFormat& source, const Container& container) {
+SoundPlan MakeSoundPlan(const EncodeParam& param, const AudioFormat& source, uint64_t speakers,
+                        const Container& container) {
     SoundPlan plan{};
     plan.codec = FindSoundCodec(container, param.fccAudio);
     if (plan.codec == nullptr)
@@ -205,6 +206,8 @@ SoundPlan MakeSoundPlan(const EncodeParam& param, const AudioFormat& source, con
 }
 
 /// What the container carries of the tracks beside the engine's. Sound is encoded as the engine's is.
+    plan.settings.speakers = speakers;
+    plan.settings.layouts = carriage.layouts != nullptr ? carriage.layouts : plan.codec->layouts;
 std::vector<TrackPlan> MakeTrackPlans(const EncodeParam& param, const FilePlan& file, const Extras& extras) {
     std::vector<TrackPlan> plans;
     const Container& container = *file.container;
@@ -216,7 +219,7 @@ std::vector<TrackPlan> MakeTrackPlans(const EncodeParam& param, const FilePlan& 
             own.nBitsPerSample = track.bitsPerSample;
             if (track.bitrate > 0)
                 own.nAudioBitrate = static_cast<int32_t>(track.bitrate);
-            plans.push_back({&track, MakeSoundPlan(own, {}, container)});
+            plans.push_back({&track, MakeSoundPlan(own, {}, track.speakers, container)});
         } else if (track.parameters &&
                    PacketForm(container, track.parameters->codec_id) != AV_CODEC_ID_NONE) {
             plans.push_back({&track, std::nullopt});
@@ -277,7 +280,7 @@ FilePlan MakeFilePlan(const EncodeParam& param, const VideoFormat* video, const 
     const bool hasSound = audio != nullptr && param.bNoAudio == 0 && plan.container->audio.front() != 0;
     plan.soundBeside = hasSound && options.bSoundBeside != 0;
     if (hasSound && !plan.soundBeside)
-        plan.sound = MakeSoundPlan(param, *audio, *plan.container);
+        plan.sound = MakeSoundPlan(param, *audio, options.nChannelMask, *plan.container);
     if (!plan.pictures && !hasSound)
         throw WriterFailure(kWriterErrorArgument,
                             "There is nothing to write into a file of the format " + FormatText(param) + ".");

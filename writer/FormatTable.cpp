@@ -82,16 +82,28 @@ constexpr std::array kPictureCodecs{
     PictureCodec{kGif,   AV_CODEC_ID_GIF,        "gif",        kPalette,    false, false, 0.0, kNoQuality, kOneSpeed, kNotAhead, "", 600},
 };
 
+constexpr std::array<uint64_t, 9> kUsualLayouts{ // where only their number is told
+    AV_CH_LAYOUT_MONO, AV_CH_LAYOUT_STEREO, AV_CH_LAYOUT_2POINT1, AV_CH_LAYOUT_4POINT0, AV_CH_LAYOUT_5POINT0_BACK,
+    AV_CH_LAYOUT_5POINT1_BACK, AV_CH_LAYOUT_6POINT1, AV_CH_LAYOUT_7POINT1, 0};
+constexpr std::array<uint64_t, 10> kAacLayouts{
+    AV_CH_LAYOUT_MONO, AV_CH_LAYOUT_STEREO, AV_CH_LAYOUT_2POINT1, AV_CH_LAYOUT_SURROUND, AV_CH_LAYOUT_4POINT0,
+    AV_CH_LAYOUT_QUAD, AV_CH_LAYOUT_5POINT0_BACK, AV_CH_LAYOUT_5POINT1_BACK, AV_CH_LAYOUT_7POINT1, 0};
+constexpr std::array<uint64_t, 9> kXiphLayouts{
+    AV_CH_LAYOUT_MONO, AV_CH_LAYOUT_STEREO, AV_CH_LAYOUT_SURROUND, AV_CH_LAYOUT_QUAD, AV_CH_LAYOUT_5POINT0_BACK,
+    AV_CH_LAYOUT_5POINT1_BACK, AV_CH_LAYOUT_6POINT1, AV_CH_LAYOUT_7POINT1, 0};
+constexpr std::array<uint64_t, 9> kFlacLayouts{
+    AV_CH_LAYOUT_MONO, AV_CH_LAYOUT_STEREO, AV_CH_LAYOUT_SURROUND, AV_CH_LAYOUT_QUAD, AV_CH_LAYOUT_5POINT0,
+    AV_CH_LAYOUT_5POINT1, AV_CH_LAYOUT_6POINT1, AV_CH_LAYOUT_7POINT1, 0};
 // The limits of AAC are the format's (6144 bits for a frame of 1024 samples), those of the others their encoders'.
 constexpr std::array kSoundCodecs{
-    SoundCodec{kAac,    AV_CODEC_ID_AAC,       "aac",        8, 0.5, 6.0},
+    SoundCodec{kAac,    AV_CODEC_ID_AAC,       "aac",        8, 0.5, 6.0, 0, kAacLayouts.data()},
     SoundCodec{kMp3,    AV_CODEC_ID_MP3,       "libmp3lame", 2, 0.5, 8.0},
     SoundCodec{kAc3,    AV_CODEC_ID_AC3,       "ac3",        6, 0.5, 14.0},
     SoundCodec{kFlac,   AV_CODEC_ID_FLAC,      "flac",       8, 0.0, 0.0},
     SoundCodec{kAlac,   AV_CODEC_ID_ALAC,      "alac",       8, 0.0, 0.0},
     SoundCodec{kMp2,    AV_CODEC_ID_MP2,       "mp2",        2, 0.3, 8.0},
-    SoundCodec{kOpus,   AV_CODEC_ID_OPUS,      "libopus",    8, 0.2, 5.3},
-    SoundCodec{kVorbis, AV_CODEC_ID_VORBIS,    "libvorbis",  8, 1.0, 3.8, 48000},
+    SoundCodec{kOpus,   AV_CODEC_ID_OPUS,      "libopus",    8, 0.2, 5.3, 0, kXiphLayouts.data()},
+    SoundCodec{kVorbis, AV_CODEC_ID_VORBIS,    "libvorbis",  8, 1.0, 3.8, 48000, kXiphLayouts.data()},
     SoundCodec{kPcm,    AV_CODEC_ID_PCM_S16LE, "pcm_s16le",  8, 0.0, 0.0},
 };
 
@@ -199,6 +211,9 @@ constexpr std::array kCarriages{
     // A frame of more than 768 bytes a channel counts as two there, and encoders go above their rate.
     Carriage{FourCC("AVI "), kAac, 0, false, nullptr, 4.0},
     Carriage{FourCC("MPG "), kMpeg2, 0, false, nullptr, 0, true},
+    Carriage{FourCC("OGG "), kFlac, 0, false, nullptr, 0, false, kFlacLayouts.data()},
+    Carriage{FourCC("MKV "), kPcm, 0, false, nullptr, 0, false, kUsualLayouts.data()},
+    Carriage{FourCC("MKA "), kPcm, 0, false, nullptr, 0, false, kUsualLayouts.data()},
 };
 
 /// Other names under which a codec is asked for, in capitals.

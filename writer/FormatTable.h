@@ -66,6 +66,8 @@ struct SoundCodec {
     double minBits;        ///< Least bits per sample and channel; 0: no limit.
     double maxBits;        ///< Most bits per sample and channel; 0: no bit rate at all.
     int maxSampleRate = 0; ///< 0: as the encoder tells itself.
+    /// Loudspeakers that every decoder knows, ended by 0; null: as the encoder tells itself, or any.
+    const uint64_t* layouts = nullptr;
 };
 
 /// What is not as usual when a container carries a codec.
@@ -77,7 +79,8 @@ struct Carriage {
     bool describedByPacket = false;
     const int* sampleRates = nullptr; ///< The only ones, ended by 0; null: as the codec has them.
     double maxBits = 0; ///< Most bits per sample and channel where that is less than the codec has; else 0.
-    bool steadyPictures = false; ///< Readers find the times of pictures by counting.
+    bool steadyPictures = false;       ///< Readers find the times of pictures by counting.
+    const uint64_t* layouts = nullptr; ///< The only ones that it tells apart; null: as the codec has them.
 };
 
 /// How a file can be kept playable while it grows, and what a container cannot express.

@@ -2,11 +2,14 @@
 #include "media/MediaWriter.h"
 
 #include "api/Version.h"
+#include "ffmpeg/Loudspeakers.h"
 #include "text/Utf8.h"
+#include "writer/FilePlan.h"
 #include "writer/FormatTable.h"
 #include "writer/JoinedFile.h"
 #include "writer/MediaFile.h"
 #include "writer/OptionSets.h"
+#include "writer/SoundEncoder.h"
 #include "writer/WriterStatus.h"
 
 #include <exception>
@@ -346,6 +349,21 @@ int MWPlanTicks(const EncodeParam* param, const VideoFormat* video, const int64_
             if (pacer.AnswersAtOnce())
                 pacer.Add(times[i]);
         }
+        return 1;
+    });
+}
+
+int MWPlanSound(const EncodeParam* param, const AudioFormat* audio, WriterSound* sound) {
+    return Guarded(0, [&] {
+        if (param == nullptr || audio == nullptr || sound == nullptr || sound->nSize < sizeof *sound)
+            return 0;
+        WriterOptions options{};
+        options.nChannelMask = sound->nChannelMask;
+        const writer::FilePlan plan = writer::MakeFilePlan(*param, nullptr, audio, options, Extras{});
+        const writer::SoundEncoder encoder(*plan.sound->codec, plan.sound->settings, {});
+        sound->nSampleRate = encoder.Context().sample_rate;
+        sound->nChannels = encoder.Context().ch_layout.nb_channels;
+        sound->nChannelMask = av::SpeakersOf(encoder.Context().ch_layout);
         return 1;
     });
 }

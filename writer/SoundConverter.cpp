@@ -1,5 +1,6 @@
 #include "writer/SoundConverter.h"
 
+#include "ffmpeg/Loudspeakers.h"
 #include "writer/WriterFailure.h"
 #include "writer/WriterStatus.h"
 
@@ -24,12 +25,6 @@ AVSampleFormat SampleFormatOf(int bits) {
     default:
         return AV_SAMPLE_FMT_S32;
     }
-}
-
-/// How many of the channels are used: all, or the first two as stereo where that many have no usual meaning.
-int UsedChannels(const PcmFormat& format) {
-    const av::ChannelLayout usual(format.channels);
-    return usual.Get()->order == AV_CHANNEL_ORDER_UNSPEC ? 2 : format.channels;
 }
 
 /// Takes the first `channels` channels; 24-bit samples go into the upper bytes of 32-bit ones.
@@ -64,8 +59,12 @@ bool PcmFormat::Valid() const {
            (bits == 8 || bits == 16 || bits == 24 || bits == 32);
 }
 
-SoundConverter::SoundConverter(int rate, const AVChannelLayout& layout, AVSampleFormat format)
-    : rate_(rate), format_(format), fifo_(av_audio_fifo_alloc(format, layout.nb_channels, 4096)) {
+SoundConverter::SoundConverter(int rate, const AVChannelLayout& layout, AVSampleFormat format,
+                               uint64_t speakers)
+    : rate_(rate),
+      format_(format),
+      speakers_(speakers),
+      fifo_(av_audio_fifo_alloc(format, layout.nb_channels, 4096)) {
     if (!fifo_ || av_channel_layout_copy(layout_.Get(), &layout) < 0)
         throw std::bad_alloc();
 }
@@ -124,25 +123,31 @@ av::Frame SoundConverter::Take(int samples) {
 /// Makes a resampler for `format`; what the one before still holds comes first.
 void SoundConverter::Prepare(const PcmFormat& format) {
     Finish();
-    av::ChannelLayout source(UsedChannels(format));
-    SwrContext* context = nullptr;
-    int error = swr_alloc_set_opts2(&context, layout_.Get(), format_, rate_, source.Get(),
-                                    SampleFormatOf(format.bits), format.rate, 0, nullptr);
-    av::Resampler resampler(context);
-    if (error >= 0)
-        error = swr_init(context);
+    int error = MakeResampler(format, av::SpeakersFor(format.channels, speakers_));
+    if (error < 0) // nor does FFmpeg mix every layout
+        error = MakeResampler(format, av::UsualSpeakers(format.channels));
     if (error < 0)
         ThrowUnconvertible(format, error);
-    resampler_ = std::move(resampler);
     source_ = format;
     pushed_ = 0;
     made_ = 0;
 }
 
+/// For sound of these loudspeakers, or of the first two channels as stereo where those are not known.
+int SoundConverter::MakeResampler(const PcmFormat& format, uint64_t speakers) {
+    used_ = speakers != 0 ? format.channels : 2;
+    av::ChannelLayout source;
+    av_channel_layout_from_mask(source.Get(), speakers != 0 ? speakers : AV_CH_LAYOUT_STEREO);
+    SwrContext* context = nullptr;
+    const int error = swr_alloc_set_opts2(&context, layout_.Get(), format_, rate_, source.Get(),
+                                          SampleFormatOf(format.bits), format.rate, 0, nullptr);
+    resampler_.reset(context);
+    return error < 0 ? error : swr_init(context);
+}
+
 void SoundConverter::Convert(const uint8_t* data, int frames) {
-    const int channels = UsedChannels(source_);
-    if (source_.bits == 24 || channels != source_.channels) {
-        Repack(source_, channels, data, frames, repacked_);
+    if (source_.bits == 24 || used_ != source_.channels) {
+        Repack(source_, used_, data, frames, repacked_);
         data = repacked_.data();
     }
     const av::Frame frame = NewFrame(std::max(1, swr_get_out_samples(resampler_.get(), frames)));

@@ -26,8 +26,8 @@ struct PcmFormat {
 /// Not thread-safe. Throws WriterFailure (kWriterErrorEncode) when a format cannot be converted.
 class SoundConverter {
 public:
-    /// What the encoder takes.
-    SoundConverter(int rate, const AVChannelLayout& layout, AVSampleFormat format);
+    /// What the encoder takes, and the loudspeakers of what comes: WriterOptions::nChannelMask.
+    SoundConverter(int rate, const AVChannelLayout& layout, AVSampleFormat format, uint64_t speakers);
 
     /// How many bytes of `format` are pushed at a time to keep little waiting here: about 16384 of the
     /// encoder's sample frames, or one of the format's.
@@ -51,6 +51,7 @@ public:
 
 private:
     void Prepare(const PcmFormat& format);
+    int MakeResampler(const PcmFormat& format, uint64_t speakers);
     void Convert(const uint8_t* data, int frames);
     void Drain();
     void Keep(const av::Frame& frame, int made);
@@ -59,7 +60,9 @@ private:
     const int rate_;
     av::ChannelLayout layout_;
     const AVSampleFormat format_;
+    const uint64_t speakers_;
     PcmFormat source_;
+    int used_ = 0; ///< Channels of the source that go into the resampler.
     av::Resampler resampler_;
     int64_t pushed_ = 0; ///< Sample frames that went into the resampler,
     int64_t made_ = 0;   ///< and that came out of it.

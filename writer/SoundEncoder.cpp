@@ -1,9 +1,14 @@
 #include "writer/SoundEncoder.h"
 
+#include "ffmpeg/Loudspeakers.h"
+
 #include <algorithm>
 #include <array>
+#include <bit>
 #include <new>
 #include <string>
+#include <tuple>
+#include <vector>
 
 namespace writer {
 namespace {
@@ -25,25 +30,53 @@ int ChooseSampleRate(const int* rates, int asked) {
     return above != 0 ? above : highest;
 }
 
-bool TakesLayout(const AVCodec& codec, const AVChannelLayout& layout) {
-    if (codec.ch_layouts == nullptr)
-        return true;
-    for (const AVChannelLayout* known = codec.ch_layouts; known->nb_channels != 0; ++known)
-        if (av_channel_layout_compare(known, &layout) == 0)
-            return true;
-    return false;
+/// What can be chosen; every codec in the table takes one channel. One that takes any gets the usual ones and
+/// `wanted`, unless these are loudspeakers of which no file tells.
+std::vector<uint64_t> Layouts(const AVCodec& codec, const uint64_t* only, int most, uint64_t wanted) {
+    constexpr uint64_t kToldInFiles = (1 << 18) - 1; // from the front left one to the top back right one
+    std::vector<uint64_t> layouts;
+    if (only != nullptr) {
+        for (; *only != 0; ++only)
+            layouts.push_back(*only);
+    } else if (codec.ch_layouts != nullptr) {
+        for (const AVChannelLayout* known = codec.ch_layouts; known->nb_channels != 0; ++known)
+            layouts.push_back(av::SpeakersOf(*known));
+    } else {
+        for (int channels = 1; channels <= most; ++channels)
+            layouts.push_back(av::UsualSpeakers(channels));
+        if ((wanted & ~kToldInFiles) == 0)
+            layouts.push_back(wanted);
+    }
+    std::erase_if(layouts, [most](uint64_t layout) { return std::popcount(layout) > most; });
+    return layouts;
 }
 
-/// The usual layout of the largest number of channels, at most `asked`, that the codec takes; every one in
-/// the table takes one channel.
-void ChooseLayout(const AVCodec& codec, int asked, AVChannelLayout& layout) {
-    for (int channels = asked; channels > 0; --channels) {
-        const av::ChannelLayout candidate(channels);
-        if (candidate.Get()->order != AV_CHANNEL_ORDER_UNSPEC && TakesLayout(codec, *candidate.Get())) {
-            av_channel_layout_copy(&layout, candidate.Get());
-            return;
-        }
-    }
+/// How much of `wanted` a layout keeps in its place; the deep tones least of all. What comes from behind can
+/// come from one loudspeaker as well as from two.
+int Kept(uint64_t layout, uint64_t wanted) {
+    constexpr uint64_t kBehind = AV_CH_BACK_LEFT | AV_CH_BACK_CENTER;
+    layout = av::AlikeSpeakers(layout);
+    wanted = av::AlikeSpeakers(wanted);
+    const uint64_t kept = layout & wanted;
+    const bool behind = (layout & kBehind) != 0 && (wanted & kBehind) != 0;
+    return 2 * std::popcount(kept) - ((kept & AV_CH_LOW_FREQUENCY) != 0 ? 1 : 0) + (behind ? 2 : 0);
+}
+
+/// The layout that is asked for, or the one of those at hand that keeps most of it, with the fewest channels.
+void ChooseLayout(const AVCodec& codec, const SoundSettings& settings, int most, AVChannelLayout& layout) {
+    const int channels = std::min(settings.channels, most);
+    uint64_t wanted = av::SpeakersFor(settings.channels, settings.speakers);
+    if (wanted == 0)
+        wanted = av::UsualSpeakers(channels);
+    const auto worth = [wanted](uint64_t one) {
+        const int count = std::popcount(one);
+        return std::tuple(Kept(one, wanted), one == wanted, -count, one == av::UsualSpeakers(count));
+    };
+    const std::vector<uint64_t> layouts = Layouts(codec, settings.layouts, channels, wanted);
+    const auto best = std::max_element(layouts.begin(), layouts.end(), [&](uint64_t one, uint64_t other) {
+        return worth(one) < worth(other);
+    });
+    av_channel_layout_from_mask(&layout, *best);
 }
 
 AVSampleFormat ChooseSampleFormat(const AVCodec& codec, int bitsPerSample, bool lossless) {
@@ -89,7 +122,7 @@ SoundEncoder::SoundEncoder(const SoundCodec& codec, const SoundSettings& setting
         settings.sampleRates != nullptr ? settings.sampleRates : context.codec->supported_samplerates, rate);
     context.time_base = {1, context.sample_rate};
     context.sample_fmt = ChooseSampleFormat(*context.codec, settings.bitsPerSample, codec.maxBits == 0);
-    ChooseLayout(*context.codec, std::min(settings.channels, codec.maxChannels), context.ch_layout);
+    ChooseLayout(*context.codec, settings, codec.maxChannels, context.ch_layout);
     if (codec.maxBits > 0) {
         context.bit_rate = ClampBitrate(codec, settings, context);
         if (codec.id == AV_CODEC_ID_MP2)

@@ -15,16 +15,19 @@ struct SoundSettings {
     int channels;
     int bitsPerSample;
     int64_t bitrate;
-    int64_t maxBitrate;     ///< Upper rate; 0: no limit.
-    const int* sampleRates; ///< The only ones, ended by 0; null: as the encoder has them.
-    double maxBits;         ///< Most bits per sample and channel beside the codec's own limit; 0: none.
+    int64_t maxBitrate;      ///< Upper rate; 0: no limit.
+    const int* sampleRates;  ///< The only ones, ended by 0; null: as the encoder has them.
+    uint64_t speakers;       ///< Of the source; see WriterOptions::nChannelMask.
+    const uint64_t* layouts; ///< The only ones, ended by 0; null: as the codec has them.
+    double maxBits;          ///< Most bits per sample and channel beside the codec's own limit; 0: none.
 };
 
 /// Packets carry the time of their first sample, in sample frames since the first one; it can be below 0
 /// where a codec needs a run-up.
 class SoundEncoder {
 public:
-    /// Rate and channels are brought to what the codec takes: the nearest higher rate, at most its channels.
+    /// Rate and channels are brought to what the codec takes: the nearest higher rate, the layout that keeps
+    /// most of the source's.
     /// Throws WriterFailure (kWriterErrorCodec).
     SoundEncoder(const SoundCodec& codec, const SoundSettings& settings, EncoderFlags flags);
 

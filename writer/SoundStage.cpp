@@ -21,7 +21,7 @@ constexpr int64_t kSilenceAtOnce = 65536;
 SoundStage::SoundStage(const SoundPlan& plan, EncoderFlags flags)
     : plan_(plan),
       encoder_(*plan.codec, plan.settings, flags),
-      converter_(Encoder().sample_rate, Encoder().ch_layout, Encoder().sample_fmt),
+      converter_(Encoder().sample_rate, Encoder().ch_layout, Encoder().sample_fmt, plan.settings.speakers),
       thread_(kMostBlocks, kMostBytes,
               {L"MediaWriter::The conversion waits for the sound encoder",
                L"MediaWriter::The sound encoder waits for the conversion"}) {}

@@ -193,6 +193,10 @@ typedef struct WriterOptions {
     /// Nonzero: pictures come exactly at EncodeParam's rate, left out or repeated. By default a source of the
     /// same rate keeps its own times, but in MPG, and MPEG-2 comes at the next rate above that it has.
     int32_t bSteadyRate;
+    /// The loudspeakers that the channels of the sound are for: FFmpeg's AV_CH_..., together, in whose order
+    /// the channels come. 0, or another number of them than there are channels: the usual ones of that
+    /// number.
+    uint64_t nChannelMask;
 } WriterOptions;
 
 /// What a piece holds.
@@ -315,6 +319,7 @@ typedef struct WriterTrack {
     const struct AVCodecParameters* pParameters;
     WriterTrackReader pfnNext; ///< Asked for its items.
     void* pContext; ///< Its first argument. Both have to last until the last file of the set is closed.
+    uint64_t nChannelMask; ///< Of sound to encode, as in WriterOptions.
 } WriterTrack;
 
 /// Adds a track. Its number is the next one from kWriterTrackFurther on. Formats without kWriterFormatTracks
@@ -370,6 +375,18 @@ int MWPlanTicks(const EncodeParam* param, const VideoFormat* video, const int64_
                 int64_t* ticks);
 
 #define kWriterNoTick INT64_MIN ///< No picture is shown before this one.
+
+/// Sound as it is going to be in a file.
+typedef struct WriterSound {
+    uint32_t nSize MW_SIZE_OF(WriterSound); ///< Size of this record in bytes.
+    int32_t nSampleRate;                    ///< Samples per second.
+    int32_t nChannels;                      ///< Channel count.
+    uint64_t nChannelMask;                  ///< As in WriterOptions.
+} WriterSound;
+
+/// What the format and the codec of `param` make of the sound, of which `sound` tells the channel mask.
+/// Returns 1; 0 when the parameters make no sense, or there is no encoder or no memory.
+int MWPlanSound(const EncodeParam* param, const AudioFormat* audio, WriterSound* sound);
 
 /// How many pictures behind the end of a piece are to be written into it as well, where there are that many:
 /// its encoder looks at them, so that the last pictures of the piece get the bits that they get in an

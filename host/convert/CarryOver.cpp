@@ -88,6 +88,7 @@ public:
         track.nChannels = plan.channels.value_or(stream.sound->channels);
         track.nBitsPerSample = stream.sound->bitsPerSample;
         track.nBitrate = plan.rate.value_or(0);
+        track.nChannelMask = stream.sound->speakers;
         tracks_.push_back({track, &movie_.ReadSoundBeside(stream.index), stream});
     }
 

@@ -85,6 +85,7 @@ WriterWatch::WriterWatch(const Request& request, const SourceInfo& source, Bell&
     writer.nEncoderThreads = request.encoderThreads;
     writer.bBitExact = request.bitExact ? 1 : 0;
     writer.bSoundBeside = request.copySound ? 1 : 0;
+    writer.nChannelMask = source.sound ? source.sound->speakers : 0;
     writer.dFileLength = request.split.value_or(request.length.value_or(0));
     if (request.piece)
         SetPiece(writer, *request.piece);

@@ -12,9 +12,14 @@ AVSampleFormat OutputFormat(const AudioFormat& sound) {
     return sound.nBitsPerSample == 32 ? AV_SAMPLE_FMT_S32 : AV_SAMPLE_FMT_S16;
 }
 
-/// A layout with places for its channels: some sources tell only how many there are.
-void CopyLayout(AVChannelLayout& target, const AVChannelLayout& source) {
-    if (source.order == AV_CHANNEL_ORDER_UNSPEC) {
+/// A layout with places for its channels: some sources tell only how many there are. `known`, of a stream
+/// that has as many, tells it then.
+void CopyLayout(AVChannelLayout& target, const AVChannelLayout& source,
+                const AVChannelLayout* known = nullptr) {
+    if (source.order != AV_CHANNEL_ORDER_NATIVE && known != nullptr &&
+        known->nb_channels == source.nb_channels) {
+        av_channel_layout_copy(&target, known);
+    } else if (source.order == AV_CHANNEL_ORDER_UNSPEC) {
         av_channel_layout_uninit(&target);
         av_channel_layout_default(&target, source.nb_channels);
     } else {
@@ -72,16 +77,18 @@ bool PcmDecoder::Accept(const AVFrame& frame) {
 
 /// Makes a resampler for the frame's form if the last frame had another one. False when there is none for it.
 bool PcmDecoder::FitResampler(const AVFrame& frame) {
+    av::ChannelLayout layout;
+    CopyLayout(*layout.Get(), frame.ch_layout, outputLayout_.Get());
     const bool fits = resampler_ && frame.format == inputForm_->format &&
                       frame.sample_rate == inputForm_->sample_rate &&
-                      frame.ch_layout.nb_channels == inputForm_->ch_layout.nb_channels;
+                      av_channel_layout_compare(&inputForm_->ch_layout, layout.Get()) == 0;
     if (fits)
         return true;
     if (resampler_)
         PushPlaced(std::nullopt, Resample(nullptr));
     inputForm_->format = frame.format;
     inputForm_->sample_rate = frame.sample_rate;
-    CopyLayout(inputForm_->ch_layout, frame.ch_layout);
+    av_channel_layout_copy(&inputForm_->ch_layout, layout.Get());
     SwrContext* resampler = resampler_.release();
     int result = swr_alloc_set_opts2(
         &resampler, outputLayout_.Get(), OutputFormat(format_), format_.nSampleRate, &inputForm_->ch_layout,

@@ -99,6 +99,7 @@ struct SoundStreamInfo {
     std::string layout; ///< "stereo", "5.1".
     int sampleRate = 0;
     int channels = 0;
+    uint64_t speakers = 0;  ///< FFmpeg's AV_CH_... of the channels, in their order; 0: not told.
     int bitsPerSample = 16; ///< Of the PCM handed out: 16, or 32 for sources that hold more than 16.
     double duration = 0;
 };

@@ -1,5 +1,6 @@
 #include "host/source/StreamDescription.h"
 
+#include "ffmpeg/Loudspeakers.h"
 #include "host/source/ColourMatrix.h"
 #include "host/source/MediaTime.h"
 #include "host/source/SubtitleFile.h"
@@ -196,6 +197,7 @@ SoundStreamInfo DescribeSound(const AVStream* stream) {
     info.layout = LayoutName(parameters.ch_layout);
     info.sampleRate = parameters.sample_rate;
     info.channels = parameters.ch_layout.nb_channels;
+    info.speakers = av::SpeakersOf(parameters.ch_layout);
     const int storedBits =
         std::max(parameters.bits_per_raw_sample, av_get_exact_bits_per_sample(parameters.codec_id));
     info.bitsPerSample = storedBits > 16 ? 32 : 16;

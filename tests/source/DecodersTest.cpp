@@ -8,7 +8,9 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <array>
 #include <cmath>
+#include <cstdlib>
 #include <fcntl.h>
 #include <memory>
 #include <unistd.h>
@@ -331,6 +333,32 @@ TEST(Decoders, GiveWhatIsWholeBehindDamageAtTheEnd) {
     EXPECT_FALSE(decoder.Decode(nullptr, count));
     EXPECT_EQ(pictures, 24);
     EXPECT_EQ(decoder.Damaged(), 1);
+}
+
+TEST(Decoders, BringSoundToTheLoudspeakersThatItBeganWith) {
+    const auto tone = [](const char* layout, const char* channels) {
+        return Make(std::string("centre-") + layout + ".ac3",
+                    {"-f", "lavfi", "-i",
+                     std::string("aevalsrc=") + channels + ":c=" + layout + ":s=48000:d=1", "-c:a", "ac3"});
+    };
+    // The centre sounds in the second half, which is the third channel there, and none in the first half.
+    const std::string first = ReadFile(tone("3.0(back)", "0|0|0"));
+    const Folder folder;
+    WriteFile(folder / "changes.ac3", first + ReadFile(tone("3.0", "0|0|sin(880*PI*t)/2")));
+    Movie movie(folder / "changes.ac3", {});
+    ASSERT_EQ(movie.Info().sound->channels, 3);
+    std::array<int, 3> loudest{};
+    while (const AudioFrame* block = movie.Sound()->GetNextFrame()) {
+        if (block->nLength == 0)
+            break;
+        const auto* samples = reinterpret_cast<const int16_t*>(block->pData);
+        for (int i = 0; i < block->nLength / 2; ++i)
+            loudest[static_cast<std::size_t>(i) % 3] =
+                std::max(loudest[static_cast<std::size_t>(i) % 3], std::abs(int{samples[i]}));
+    }
+    EXPECT_GT(loudest[0], 5000);
+    EXPECT_GT(loudest[1], 5000);
+    EXPECT_LT(loudest[2], 1000) << "the centre comes from behind";
 }
 
 /// Two transport streams end to end; `mixed`, the second's first pictures come before the last sound of the

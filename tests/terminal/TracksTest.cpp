@@ -1,4 +1,5 @@
 // Further tracks of a movie come into the output beside its pictures and its first sound.
+#include "host/source/Movie.h"
 #include "tests/support/Folder.h"
 #include "tests/support/Program.h"
 #include "tests/support/TestMovies.h"
@@ -61,6 +62,21 @@ TEST(Tracks, FurtherSoundComesIntoEveryFormatThatHoldsSeveral) {
         flash.out.find(R"("event":"not_carried","kind":"sound","number":2,"codec":"flac","language":"eng")"),
         std::string::npos)
         << flash.out;
+}
+
+TEST(Tracks, OfSoundKeepTheirLoudspeakers) {
+    const std::string source = test_movies::Make(
+        "loudspeakers.mkv", Words("-f lavfi -i anullsrc=cl=3.0:r=48000:d=0.3 -f lavfi -i "
+                                  "anullsrc=cl=quad:r=48000:d=0.3 -map 0 -map 1 -c:a flac"));
+    for (const char* const name : {"o.mp4", "o.mkv"}) {
+        const Folder folder;
+        const Result result = Call({source, folder / name});
+        ASSERT_EQ(result.code, 0) << result.err;
+        const movieconv::SourceInfo made = movieconv::Movie(folder / name, {}).Info();
+        ASSERT_EQ(made.streams.size(), 2u);
+        EXPECT_EQ(made.streams[0].sound->layout, "3.0") << name;
+        EXPECT_EQ(made.streams[1].sound->layout, "quad") << name;
+    }
 }
 
 TEST(Tracks, ClipsJoinToTheSample) {

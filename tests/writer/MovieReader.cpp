@@ -39,6 +39,15 @@ void TakeSound(const AVFrame& frame, AVRational unit, ReadMovie& movie) {
     ASSERT_EQ(swr_convert_frame(toFloat.get(), floats.get(), &frame), 0);
     const auto* first = reinterpret_cast<const float*>(floats->data[0]);
     movie.firstChannel.insert(movie.firstChannel.end(), first, first + floats->nb_samples);
+    const av::ChannelLayout usual(frame.ch_layout.nb_channels);
+    const bool told = frame.ch_layout.order != AV_CHANNEL_ORDER_UNSPEC;
+    for (int channel = 0; channel < frame.ch_layout.nb_channels; ++channel) {
+        const AVChannel place = av_channel_layout_channel_from_index(told ? &frame.ch_layout : usual.Get(),
+                                                                     static_cast<unsigned>(channel));
+        const auto* samples = reinterpret_cast<const float*>(floats->extended_data[channel]);
+        float& loudest = movie.loudest[place < 0 ? 0 : uint64_t{1} << place];
+        loudest = std::max(loudest, *std::max_element(samples, samples + floats->nb_samples));
+    }
 }
 
 av::CodecContext OpenDecoder(const AVStream& stream) {

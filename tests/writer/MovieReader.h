@@ -8,6 +8,7 @@
 
 #include <cstdint>
 #include <functional>
+#include <map>
 #include <string>
 #include <vector>
 
@@ -38,6 +39,8 @@ struct ReadMovie {
     double audioStart = 0;           ///< Seconds; time of the first sample that is heard.
     int64_t samples = 0;             ///< Sample frames decoded.
     std::vector<float> firstChannel; ///< Decoded samples, -1 to 1.
+    std::map<uint64_t, float>
+        loudest; ///< Sample of each loudspeaker (AV_CH_...), with its usual layout untold.
 
     /// Seconds at which the sound is no longer silent.
     double ToneBegins() const;

@@ -5,8 +5,11 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <bit>
 #include <cmath>
 #include <cstdint>
+#include <map>
+#include <utility>
 #include <vector>
 
 namespace {
@@ -139,6 +142,117 @@ TEST(Sound, LateSoundBeginsLate) {
         });
         EXPECT_NEAR(read.ToneBegins(), 0.4, 0.03) << format;
         EXPECT_NEAR(read.pictures.front().time, 0.0, 0.03) << format;
+    }
+}
+
+/// How loud each loudspeaker of the file is when one of the source's sounds; the others are silent.
+std::map<uint64_t, float> HeardOf(TestMovie movie, uint64_t layout, uint64_t speaker) {
+    constexpr int kSamples = 12'000;
+    WriterOptions options{};
+    options.nChannelMask = layout;
+    const RegisteredOptions registered(options);
+    movie.Use(registered);
+    movie.hasVideo = false;
+    movie.sampleRate = 48'000;
+    movie.channels = std::popcount(layout);
+    movie.param.nAudioBitrate = 96'000 * movie.channels;
+    const Folder folder;
+    void* file = movie.Create(folder / "movie");
+    TestSound sound(movie.sampleRate, movie.channels, 16);
+    AudioFrame block = sound.Next(kSamples, 0);
+    auto* samples = reinterpret_cast<int16_t*>(block.pData);
+    const int sounding = std::popcount(layout & (speaker - 1));
+    for (int i = 0; i < kSamples * movie.channels; ++i)
+        if (i % movie.channels != sounding)
+            samples[i] = 0;
+    MWWriteAudioData(file, &block);
+    EXPECT_EQ(MWCloseMediaFile(file, nullptr, nullptr), 1) << Latest(registered.Set()).szWhat;
+    return ReadMovieFile(folder / "movie").loudest;
+}
+
+TEST(Sound, ComesFromWhereItCame) {
+    constexpr uint64_t kRight =
+        AV_CH_FRONT_RIGHT | AV_CH_BACK_RIGHT | AV_CH_SIDE_RIGHT | AV_CH_FRONT_RIGHT_OF_CENTER;
+    constexpr uint64_t kLeft = AV_CH_BACK_LEFT | AV_CH_SIDE_LEFT | AV_CH_FRONT_LEFT_OF_CENTER;
+    const struct {
+        uint64_t speaker;
+        uint64_t silent; // loudspeakers that may not sound instead
+    } kSpeakers[] = {{AV_CH_FRONT_LEFT, kRight | AV_CH_FRONT_CENTER | AV_CH_BACK_CENTER},
+                     {AV_CH_FRONT_CENTER, AV_CH_BACK_CENTER | kLeft | (kRight & ~AV_CH_FRONT_RIGHT)},
+                     {AV_CH_BACK_LEFT, kRight | AV_CH_FRONT_CENTER},
+                     {AV_CH_BACK_CENTER, AV_CH_FRONT_CENTER},
+                     {AV_CH_SIDE_LEFT, kRight | AV_CH_FRONT_CENTER},
+                     {AV_CH_FRONT_LEFT_OF_CENTER, kRight | AV_CH_BACK_CENTER}};
+    constexpr std::pair<uint32_t, uint32_t> kFormats[] = {
+        {FourCC("MP4 "), FourCC("AAC ")}, {FourCC("MKV "), FourCC("AC3 ")}, {FourCC("FLAC"), FourCC("FLAC")},
+        {FourCC("OGG "), FourCC("FLAC")}, {FourCC("MKV "), FourCC("FLAC")}, {FourCC("M4A "), FourCC("ALAC")},
+        {FourCC("OGG "), FourCC("VORB")}, {FourCC("MKV "), FourCC("OPUS")}, {FourCC("MKV "), FourCC("PCM ")},
+        {FourCC("MKA "), FourCC("PCM ")}, {FourCC("WAV "), FourCC("PCM ")}, {FourCC("MOV "), FourCC("PCM ")},
+        {FourCC("AVI "), FourCC("PCM ")}, {FourCC("MP3 "), FourCC("MP3 ")}};
+    for (const auto& [format, codec] : kFormats)
+        for (const uint64_t layout :
+             {AV_CH_LAYOUT_2POINT1, AV_CH_LAYOUT_SURROUND, AV_CH_LAYOUT_2_1, AV_CH_LAYOUT_QUAD,
+              AV_CH_LAYOUT_3POINT1, AV_CH_LAYOUT_4POINT1, AV_CH_LAYOUT_5POINT1, AV_CH_LAYOUT_6POINT0,
+              AV_CH_LAYOUT_6POINT1_BACK, AV_CH_LAYOUT_7POINT0, AV_CH_LAYOUT_7POINT1_WIDE})
+            for (const auto& [speaker, silent] : kSpeakers) {
+                if ((layout & speaker) == 0)
+                    continue;
+                SCOPED_TRACE(testing::Message() << std::hex << format << ' ' << codec << ", layout " << layout
+                                                << ", from " << speaker);
+                TestMovie movie;
+                movie.param.fccFileFormat = format;
+                movie.param.fccAudio = codec;
+                const std::map<uint64_t, float> heard = HeardOf(movie, layout, speaker);
+                float loudest = 0;
+                for (const auto& [at, loud] : heard) {
+                    loudest = std::max(loudest, loud);
+                    EXPECT_TRUE(loud < 0.05F || (at & (silent | AV_CH_LOW_FREQUENCY)) == 0)
+                        << "from " << at << " comes " << loud;
+                    if (at == speaker) {
+                        EXPECT_GT(loud, 0.15F);
+                    }
+                }
+                EXPECT_GT(loudest, 0.1F);
+            }
+}
+
+TEST(Sound, OfAnyLayoutGetsTheNearestThatTheCodecHas) {
+    const struct {
+        uint32_t format, codec;
+        uint64_t layout;
+        int channels; // that are asked for; 0: as they are
+        uint64_t made;
+    } cases[] = {
+        {FourCC("MP4 "), FourCC("AAC "), AV_CH_LAYOUT_QUAD, 0, AV_CH_LAYOUT_QUAD},
+        {FourCC("MP4 "), FourCC("AAC "), AV_CH_LAYOUT_5POINT1, 0, AV_CH_LAYOUT_5POINT1_BACK},
+        {FourCC("MP4 "), FourCC("AAC "), AV_CH_LAYOUT_QUAD, 6, AV_CH_LAYOUT_5POINT1_BACK},
+        {FourCC("MP4 "), FourCC("AAC "), AV_CH_LAYOUT_6POINT0, 2, AV_CH_LAYOUT_STEREO},
+        {FourCC("MP4 "), FourCC("AAC "), AV_CH_LAYOUT_STEREO_DOWNMIX, 0, AV_CH_LAYOUT_STEREO},
+        {FourCC("MKV "), FourCC("FLAC"), AV_CH_LAYOUT_5POINT1, 0, AV_CH_LAYOUT_5POINT1},
+        {FourCC("MKV "), FourCC("OPUS"), AV_CH_LAYOUT_3POINT1, 0, AV_CH_LAYOUT_SURROUND},
+        {FourCC("MKV "), FourCC("OPUS"), 0, 4, AV_CH_LAYOUT_SURROUND},
+        {FourCC("M4A "), FourCC("ALAC"), AV_CH_LAYOUT_QUAD, 0, AV_CH_LAYOUT_4POINT0},
+        {FourCC("M4A "), FourCC("ALAC"), AV_CH_LAYOUT_7POINT1, 0, AV_CH_LAYOUT_5POINT1_BACK},
+        {FourCC("MKV "), FourCC("AC3 "), AV_CH_LAYOUT_7POINT1, 0, AV_CH_LAYOUT_5POINT1_BACK},
+        {FourCC("WAV "), FourCC("PCM "), AV_CH_LAYOUT_7POINT1_WIDE, 0, AV_CH_LAYOUT_7POINT1_WIDE},
+        {FourCC("MP3 "), FourCC("MP3 "), AV_CH_LAYOUT_7POINT1, 0, AV_CH_LAYOUT_STEREO},
+    };
+    for (const auto& test : cases) {
+        SCOPED_TRACE(&test - cases);
+        EncodeParam param = TestMovie::Param();
+        param.fccFileFormat = test.format;
+        param.fccAudio = test.codec;
+        param.nChannels = test.channels;
+        const int channels = test.layout != 0 ? std::popcount(test.layout) : test.channels;
+        const AudioFormat format{48'000, channels, 16, 0, 1.0};
+        WriterSound sound{};
+        sound.nChannelMask = test.layout;
+        ASSERT_EQ(MWPlanSound(&param, &format, &sound), 1);
+        EXPECT_EQ(sound.nChannelMask, test.made);
+        EXPECT_EQ(sound.nChannels, std::popcount(test.made));
+        EXPECT_EQ(sound.nSampleRate, 48'000);
+        sound.nSize -= 1;
+        EXPECT_EQ(MWPlanSound(&param, &format, &sound), 0);
     }
 }
 
