@@ -131,6 +131,11 @@ int RgbMatrix(const PictureSettings& settings) {
     return settings.height >= kLeastHdHeight ? SWS_CS_ITU709 : SWS_CS_ITU601;
 }
 
+/// What is not stated is taken for it, too.
+bool IsBt601(AVColorSpace matrix) {
+    return matrix == AVCOL_SPC_UNSPECIFIED || matrix == AVCOL_SPC_BT470BG || matrix == AVCOL_SPC_SMPTE170M;
+}
+
 PicturePlan MakePicturePlan(const EncodeParam& param, const VideoFormat& source, const Container& container,
                             const WriterOptions& options) {
     PicturePlan plan{};
@@ -159,7 +164,12 @@ PicturePlan MakePicturePlan(const EncodeParam& param, const VideoFormat& source,
     }
     if (plan.codec->format == AV_PIX_FMT_YUVJ420P)
         plan.picture.fullRange = true;
-    plan.picture.matrix = RgbMatrix(plan.settings);
+    plan.picture.matrix = plan.picture.sourceMatrix = RgbMatrix(plan.settings);
+    const Carriage& carriage = FindCarriage(container, plan.codec->code);
+    if ((plan.codec->isBt601 || carriage.isBt601) && !IsBt601(plan.settings.matrix)) {
+        plan.picture.matrix = SWS_CS_ITU601;
+        plan.settings.matrix = AVCOL_SPC_BT470BG;
+    }
     plan.toPalette = plan.codec->format == AV_PIX_FMT_PAL8;
     if (plan.toPalette)
         plan.picture.format = kPaletteSource;
@@ -169,7 +179,7 @@ PicturePlan MakePicturePlan(const EncodeParam& param, const VideoFormat& source,
     const double sourceRate = UsableRate(source.dFrameRate);
     const double rate = av_q2d(plan.settings.rate);
     plan.keepStamps = sourceRate > 0.0 && SameRate(rate, sourceRate) && options.bSteadyRate == 0 &&
-                      !FindCarriage(container, plan.codec->code).steadyPictures;
+                      !carriage.steadyPictures;
     if (options.nPiece == kWriterPiecePictures) {
         if (options.bPieceContinues != 0)
             plan.tickBefore = options.llPieceTick;
@@ -196,6 +206,8 @@ SoundPlan MakeSoundPlan(const EncodeParam& param, const AudioFormat& source, uin
     const Carriage& carriage = FindCarriage(container, plan.codec->code);
     plan.settings.sampleRates = carriage.sampleRates;
     plan.settings.maxBits = carriage.maxBits;
+    plan.settings.speakers = speakers;
+    plan.settings.layouts = carriage.layouts != nullptr ? carriage.layouts : plan.codec->layouts;
     plan.fillsStart = container.kind == ContainerKind::kSteadyRate;
     plan.neverEmpty = carriage.describedByPacket;
     if (plan.settings.sampleRate <= 0 || plan.settings.channels <= 0)
@@ -206,8 +218,6 @@ SoundPlan MakeSoundPlan(const EncodeParam& param, const AudioFormat& source, uin
 }
 
 /// What the container carries of the tracks beside the engine's. Sound is encoded as the engine's is.
-    plan.settings.speakers = speakers;
-    plan.settings.layouts = carriage.layouts != nullptr ? carriage.layouts : plan.codec->layouts;
 std::vector<TrackPlan> MakeTrackPlans(const EncodeParam& param, const FilePlan& file, const Extras& extras) {
     std::vector<TrackPlan> plans;
     const Container& container = *file.container;

@@ -72,13 +72,13 @@ constexpr std::array kPictureCodecs{
     PictureCodec{kXvid,  AV_CODEC_ID_MPEG4,      "mpeg4",      kPlanar,     false, false, 0.0, kQuantiser, kOneSpeed, kNotAhead, ""},
     PictureCodec{kH264,  AV_CODEC_ID_H264,       "libx264",    kPlanar,     false, true,  2.0, kCrf51, kX26Speeds, kX264Ahead, ""},
     PictureCodec{kHevc,  AV_CODEC_ID_HEVC,       "libx265",    kPlanar,     true,  true,  0.0, kCrf51, kX26Speeds, kX265Ahead, kX265Options},
-    PictureCodec{kMjpg,  AV_CODEC_ID_MJPEG,      "mjpeg",      kPlanarFull, false, false, 0.0, kQuantiser, kOneSpeed, kNotAhead, ""},
-    PictureCodec{kVp8,   AV_CODEC_ID_VP8,        "libvpx",     kPlanar,     false, false, 1.0, kCapped63, kVpxSpeeds, kNotAhead, kVpxOptions},
+    PictureCodec{kMjpg,  AV_CODEC_ID_MJPEG,      "mjpeg",      kPlanarFull, false, false, 0.0, kQuantiser, kOneSpeed, kNotAhead, "", 0, nullptr, true},
+    PictureCodec{kVp8,   AV_CODEC_ID_VP8,        "libvpx",     kPlanar,     false, false, 1.0, kCapped63, kVpxSpeeds, kNotAhead, kVpxOptions, 0, nullptr, true},
     PictureCodec{kVp9,   AV_CODEC_ID_VP9,        "libvpx-vp9", kPlanar,     true,  false, 1.0, kCrf63, kVpxSpeeds, kNotAhead, kVpxOptions},
     PictureCodec{kAv1,   AV_CODEC_ID_AV1,        "libsvtav1",  kPlanar,     true,  true,  0.0, kCrf63, kAv1Speeds, kNotAhead, ""},
     PictureCodec{kFfv1,  AV_CODEC_ID_FFV1,       "ffv1",       kPlanar,     true,  false, 1.0, kNoQuality, kOneSpeed, kNotAhead, kFfv1Options},
     PictureCodec{kMpeg2, AV_CODEC_ID_MPEG2VIDEO, "mpeg2video", kPlanar,     false, false, 0.0, kQuantiser, kOneSpeed, kNotAhead, "", 0, kMpeg2Rates.data()},
-    PictureCodec{kFlv1,  AV_CODEC_ID_FLV1,       "flv",        kPlanar,     false, false, 0.0, kQuantiser, kOneSpeed, kNotAhead, ""},
+    PictureCodec{kFlv1,  AV_CODEC_ID_FLV1,       "flv",        kPlanar,     false, false, 0.0, kQuantiser, kOneSpeed, kNotAhead, "", 0, nullptr, true},
     PictureCodec{kGif,   AV_CODEC_ID_GIF,        "gif",        kPalette,    false, false, 0.0, kNoQuality, kOneSpeed, kNotAhead, "", 600},
 };
 
@@ -196,7 +196,8 @@ constexpr std::array kFlashRates{44100, 22050, 11025, 0};
 constexpr std::array kStandardMp3Rates{48000, 44100, 32000, 24000, 22050, 16000, 0};
 constexpr std::array kCarriages{
     Carriage{FourCC("MOV "), kXvid, kXvid},
-    Carriage{FourCC("AVI "), kXvid, kXvid},
+    Carriage{FourCC("AVI "), kXvid, kXvid, false, nullptr, 0, false, nullptr, true},
+    Carriage{FourCC("TS  "), kXvid, 0, false, nullptr, 0, false, nullptr, true},
     // Players of one large vendor take HEVC only under this tag.
     Carriage{FourCC("MP4 "), kHevc, FourCC("hvc1")},
     Carriage{FourCC("MOV "), kHevc, FourCC("hvc1")},

@@ -55,6 +55,7 @@ struct PictureCodec {
     const char* options; ///< For the encoder in any case, as "name=value,...".
     int longest = 0; ///< Seconds that a picture can be shown before it has to be there again; 0: any time.
     const AVRational* rates = nullptr; ///< All that every player knows, rising, ended by 0; null: any rate.
+    bool isBt601 = false; ///< Decoders know but the matrix of BT.601, whatever a container tells.
 };
 
 /// A codec for sound.
@@ -81,6 +82,7 @@ struct Carriage {
     double maxBits = 0; ///< Most bits per sample and channel where that is less than the codec has; else 0.
     bool steadyPictures = false;       ///< Readers find the times of pictures by counting.
     const uint64_t* layouts = nullptr; ///< The only ones that it tells apart; null: as the codec has them.
+    bool isBt601 = false;              ///< The matrix is told nowhere, so that players take BT.601's.
 };
 
 /// How a file can be kept playable while it grows, and what a container cannot express.

@@ -122,7 +122,8 @@ PictureScaler::PictureScaler(const Output& output, AVRational sampleAspect, bool
 
 av::Frame PictureScaler::Convert(av::Frame picture) {
     const bool padded = output_.padWidth > 0 || output_.padHeight > 0;
-    const bool sameFormat = picture->format == output_.format && sourceFullRange_ == output_.fullRange;
+    const bool sameFormat = picture->format == output_.format && sourceFullRange_ == output_.fullRange &&
+                            output_.sourceMatrix == output_.matrix;
     if (sameFormat && !padded && picture->width == output_.width && picture->height == output_.height)
         return picture;
     PrepareFor(*picture);
@@ -160,8 +161,8 @@ void PictureScaler::PrepareFor(const AVFrame& picture) {
     if (!scaler_)
         throw WriterFailure(kWriterErrorEncode, "Pictures of " + std::to_string(picture.width) + "x" +
                                                     std::to_string(picture.height) + " cannot be scaled.");
-    const int* matrix = sws_getCoefficients(output_.matrix);
-    sws_setColorspaceDetails(scaler_.get(), matrix, sourceFullRange_ ? 1 : 0, matrix,
+    sws_setColorspaceDetails(scaler_.get(), sws_getCoefficients(output_.sourceMatrix),
+                             sourceFullRange_ ? 1 : 0, sws_getCoefficients(output_.matrix),
                              output_.fullRange ? 1 : 0, 0, 1 << 16, 1 << 16);
 }
 

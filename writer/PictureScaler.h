@@ -58,7 +58,8 @@ public:
         int padHeight;
         AVPixelFormat format;
         bool fullRange;
-        int matrix = SWS_CS_DEFAULT; ///< Of FFmpeg's SWS_CS_..., where the format is RGB.
+        int sourceMatrix = SWS_CS_DEFAULT; ///< FFmpeg's SWS_CS_...
+        int matrix = SWS_CS_DEFAULT;       ///< Likewise, where the format is not RGB.
     };
 
     PictureScaler(const Output& output, AVRational sampleAspect, bool stretch, bool sourceFullRange);
