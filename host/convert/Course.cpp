@@ -72,8 +72,8 @@ Course::Course(const Request& request, Movie& movie, Wishes& wishes, Observer& o
         movie.EndPicturesAt(ToSeconds(request.piece->until));
     else if (request.length)
         movie.EndPicturesAt(request.begin + length_);
-    if (movie.KeepsHdr())
-        wishes.pictures.TakesHdr(*movie.Info().pictures);
+    if (movie.Info().pictures)
+        wishes.pictures.Expect(*movie.Info().pictures, movie.KeepsHdr());
 }
 
 void Course::Prepare() {

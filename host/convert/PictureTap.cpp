@@ -1,6 +1,7 @@
 #include "host/convert/PictureTap.h"
 
 #include "Common/Image/ImageConvert.h"
+#include "host/source/ColourMatrix.h"
 #include "host/source/SourceError.h"
 
 #include <algorithm>
@@ -23,6 +24,15 @@ void CopyPlane(std::vector<uint8_t>& target, const uint8_t* plane, int pitch, st
 }
 
 } // namespace
+
+void PictureTap::Expect(const PictureStreamInfo& source, bool keepsHdr) {
+    if (keepsHdr)
+        filter_.emplace(source, SourceChoice{.deinterlace = Deinterlace::kNone});
+    int matrix = HandedOutMatrix(source, false); // where HDR is kept, the filter takes it away
+    if (matrix == kMatrixUnstated)
+        matrix = UsualMatrix(source);
+    matrix_ = matrix == AVCOL_SPC_SMPTE170M ? SWS_CS_ITU601 : matrix; // the same one
+}
 
 bool PictureTap::Offer(const VideoImage& image) noexcept {
     const int64_t interval = interval_;
@@ -100,32 +110,37 @@ std::shared_ptr<const ShownPicture> PictureTap::Take() {
             return nullptr;
         std::swap(taken_, latest_);
     }
-    tagBITMAPINFOHEADER header{};
-    header.biSize = sizeof header;
-    header.biWidth = taken_.width;
-    header.biHeight = taken_.height;
-    header.biPlanes = 1;
-    header.biBitCount = 32;
-    const auto width = static_cast<std::size_t>(taken_.width);
-    const auto height = static_cast<std::size_t>(taken_.height);
     auto shown = std::make_shared<ShownPicture>();
     shown->width = taken_.width;
     shown->height = taken_.height;
-    shown->bgra.resize(width * height * 4);
-    if (taken_.deep || filter_) {
-        const av::Frame usual = Usual(taken_);
-        if (!usual)
-            return nullptr;
-        Yuv420_2_Argb(&header, shown->bgra.data(), usual->data[0], usual->data[1], usual->data[2],
-                      usual->linesize[0], usual->linesize[1], usual->linesize[2]);
-        return shown;
+    shown->bgra.resize(static_cast<std::size_t>(taken_.width) * static_cast<std::size_t>(taken_.height) * 4);
+    const av::Frame usual = Usual(taken_);
+    return usual && Paint(*usual, shown->bgra.data()) ? shown : nullptr;
+}
+
+/// False when it cannot be painted.
+bool PictureTap::Paint(const AVFrame& picture, uint8_t* bgra) {
+    if (matrix_ != SWS_CS_ITU601) {
+        scaler_.reset(sws_getCachedContext(scaler_.release(), picture.width, picture.height,
+                                           AV_PIX_FMT_YUV420P, picture.width, picture.height, AV_PIX_FMT_BGRA,
+                                           SWS_BICUBIC | SWS_ACCURATE_RND | SWS_FULL_CHR_H_INT, nullptr,
+                                           nullptr, nullptr));
+        if (!scaler_)
+            return false;
+        const int* matrix = sws_getCoefficients(matrix_);
+        sws_setColorspaceDetails(scaler_.get(), matrix, 0, matrix, 0, 0, 1 << 16, 1 << 16);
+        const int pitch = picture.width * 4;
+        return sws_scale(scaler_.get(), picture.data, picture.linesize, 0, picture.height, &bgra, &pitch) > 0;
     }
-    uint8_t* luma = taken_.bytes.data();
-    uint8_t* blue = luma + width * height;
-    uint8_t* red = blue + Half(taken_.width) * Half(taken_.height);
-    const int chromaPitch = static_cast<int>(Half(taken_.width));
-    Yuv420_2_Argb(&header, shown->bgra.data(), luma, blue, red, taken_.width, chromaPitch, chromaPitch);
-    return shown;
+    tagBITMAPINFOHEADER header{};
+    header.biSize = sizeof header;
+    header.biWidth = picture.width;
+    header.biHeight = picture.height;
+    header.biPlanes = 1;
+    header.biBitCount = 32;
+    Yuv420_2_Argb(&header, bgra, picture.data[0], picture.data[1], picture.data[2], picture.linesize[0],
+                  picture.linesize[1], picture.linesize[2]);
+    return true;
 }
 
 } // namespace movieconv

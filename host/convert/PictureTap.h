@@ -28,11 +28,9 @@ public:
     void SetInterval(Interval interval) { interval_ = interval ? interval->count() : kNone; }
     bool Wants() const { return interval_ != kNone; }
 
-    /// The pictures will be HDR ones as the source has them, to be shown on a usual display. Before the
-    /// first.
-    void TakesHdr(const PictureStreamInfo& source) {
-        filter_.emplace(source, SourceChoice{.deinterlace = Deinterlace::kNone});
-    }
+    /// Which colours the pictures will mean: the source's, or BT.709 where its HDR ones are not kept. Before
+    /// the first.
+    void Expect(const PictureStreamInfo& source, bool keepsHdr);
 
     /// Copies a planar 4:2:0 picture unless the last one is too recent; without memory it is not shown. True
     /// when there is one to take now. Any thread.
@@ -56,6 +54,7 @@ private:
 
     void Copy(const VideoImage& image) noexcept;
     av::Frame Usual(const Planes& planes);
+    bool Paint(const AVFrame& picture, uint8_t* bgra);
 
     std::atomic<int64_t> interval_; // milliseconds
     std::mutex mutex_;
@@ -67,6 +66,8 @@ private:
     Planes taken_;
     std::optional<PictureFilter> filter_;
     PictureConverter converter_{PictureStreamInfo{}, false, false};
+    int matrix_ = SWS_CS_ITU601; // FFmpeg's SWS_CS_...
+    av::Scaler scaler_;          // where it is another one
 };
 
 } // namespace movieconv

@@ -17,6 +17,7 @@ std::shared_ptr<const ShownPicture> PictureAt(const std::string& path, double se
     movie.Pictures()->Seek(seconds, 1);
     const VideoImage* image = movie.Pictures()->GetCurrentImage();
     PictureTap tap(std::chrono::milliseconds(0));
+    tap.Expect(*movie.Info().pictures, movie.KeepsHdr());
     if (image != nullptr)
         tap.OfferLast(*image);
     movie.Stop();

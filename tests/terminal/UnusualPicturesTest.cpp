@@ -1,4 +1,5 @@
-// Pictures that come faster than the engine believes, that one can look through, or whose colours are finer.
+// Pictures that come faster than the engine believes, that one can look through, whose colours are finer,
+// and what else an output cannot hold.
 #include "tests/support/Inspect.h"
 #include "tests/support/Program.h"
 #include "tests/support/TestMovies.h"
@@ -6,6 +7,7 @@
 #include <gtest/gtest.h>
 
 #include <array>
+#include <cstdlib>
 #include <string>
 
 namespace {
@@ -99,6 +101,54 @@ TEST(UnusualPictures, RgbIsShownInItsColoursByWhatTheOutputSays) {
         ASSERT_GT(picture.size(), 3u);
         for (size_t i = 0; i < kRed.size(); ++i)
             EXPECT_NEAR(static_cast<unsigned char>(picture[i]), kRed[i], 5) << i;
+    }
+}
+
+/// The middle pixel of the first picture, as "1bbd3a".
+std::string ColourOf(const std::string& path) {
+    const Result pixel = program::Run({"ffmpeg", "-v", "error", "-nostdin", "-i", path, "-frames:v", "1",
+                                       "-vf", "crop=2:2", "-f", "rawvideo", "-pix_fmt", "rgb24", "-"});
+    std::string text;
+    for (const char byte : pixel.out.substr(0, 3)) {
+        constexpr char kDigits[] = "0123456789abcdef";
+        text += kDigits[static_cast<unsigned char>(byte) >> 4];
+        text += kDigits[static_cast<unsigned char>(byte) & 15];
+    }
+    return text;
+}
+
+TEST(UnusualPictures, ColoursOfBt709StayWhatTheyWere) {
+    const std::string source = Make(
+        "green-709.mp4",
+        Words(
+            "-f lavfi -i color=0x20C040:s=320x240:d=0.4 -vf scale=out_color_matrix=bt709,format=yuv420p -c:v "
+            "libx264 -qp 1 -color_primaries bt709 -color_trc bt709 -colorspace bt709"));
+    const auto near = [](const std::string& one, const std::string& other) {
+        constexpr int kMost = 6;
+        for (std::size_t at = 0; at < 6; at += 2)
+            if (std::abs(std::stoi(one.substr(at, 2), nullptr, 16) -
+                         std::stoi(other.substr(at, 2), nullptr, 16)) > kMost)
+                return false;
+        return true;
+    };
+    const std::string colour = ColourOf(source);
+    ASSERT_EQ(colour.size(), 6u);
+    const struct {
+        const char* codec;
+        const char* output;
+    } cases[] = {{"MJPG", "o.mkv"},  {"MJPG", "o.mp4"}, {"MJPG", "o.mov"}, {"MJPG", "o.avi"},
+                 {"VP80", "o.webm"}, {"FLV1", "o.flv"}, {"XVID", "o.avi"}, {"XVID", "o.ts"},
+                 {"XVID", "o.mp4"},  {"H264", "o.ts"},  {"MPG2", "o.mpg"}, {"GIF", "o.gif"}};
+    for (const auto& [codec, output] : cases) {
+        SCOPED_TRACE(testing::Message() << codec << ' ' << output);
+        const Folder folder;
+        const Result result = Call({"--preset", "classic", "--video-codec", codec, "--video-rate", "4M",
+                                    source, folder / output, "--preview", folder / "now.png"});
+        ASSERT_EQ(result.code, 0) << result.err;
+        for (const std::string& path : {folder / output, folder / "now.png"}) {
+            const std::string seen = ColourOf(path);
+            EXPECT_TRUE(seen.size() == 6 && near(seen, colour)) << path << ' ' << seen << ", not " << colour;
+        }
     }
 }
 
