@@ -124,6 +124,7 @@ void PictureDecoder::Run() {
     ranDry_ = !refused_;
     repaired_ = stamps_.Repaired();
     deinterlaced_ = filter_.Deinterlaced();
+    leftInterlaced_ = filter_.LeftInterlaced();
     damaged_ = damagedBefore_ + decoder_->Damaged();
     queue_.Finish();
 }

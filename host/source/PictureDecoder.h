@@ -53,6 +53,7 @@ public:
     int64_t Damaged() const { return damaged_; }
     int64_t Repaired() const { return repaired_; }
     bool Deinterlaced() const { return deinterlaced_; }
+    bool LeftInterlaced() const { return leftInterlaced_; }
 
     /// Whether the source's last picture has been decoded and handed on. Any thread.
     bool RanDry() const { return ranDry_; }
@@ -104,6 +105,7 @@ private:
     std::atomic<int64_t> repaired_{0};
     std::atomic<bool> ranDry_{false};
     std::atomic<bool> deinterlaced_{false};
+    std::atomic<bool> leftInterlaced_{false};
     std::thread thread_;
 
     // The engine worker's.

@@ -45,6 +45,7 @@ bool PictureFilter::Push(AVFrame& picture, std::optional<int64_t> stamp, const S
     const bool interlaced = deinterlace_ == Deinterlace::kAll ||
                             (deinterlace_ == Deinterlace::kFlagged && picture.interlaced_frame != 0);
     deinterlaced_ = deinterlaced_ || interlaced;
+    leftInterlaced_ = leftInterlaced_ || (!interlaced && picture.interlaced_frame != 0);
     if (!graph_ && !interlaced && transfer_ == 0)
         return sink(picture, stamp);
     if (graph_ && !graph_->Fits(picture) && !Finish(sink))

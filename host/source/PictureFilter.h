@@ -34,6 +34,9 @@ public:
     /// Whether any picture was deinterlaced.
     bool Deinterlaced() const { return deinterlaced_; }
 
+    /// Whether any picture that says it is interlaced was to stay so.
+    bool LeftInterlaced() const { return leftInterlaced_; }
+
 private:
     std::string Chain() const;
     bool HandOut(const Sink& sink);
@@ -42,6 +45,7 @@ private:
     const bool deep_;
     const int transfer_; // of HDR that becomes SDR; 0: none does
     bool deinterlaced_ = false;
+    bool leftInterlaced_ = false;
     std::optional<av::FilterGraph> graph_;
     int64_t count_ = 0;
     std::deque<std::optional<int64_t>> stamps_; // of the pictures in the graph

@@ -45,9 +45,11 @@ constexpr std::array kPresetWords = {
     PresetWords{
         "phone", QT_TRANSLATE_NOOP("Presets", "Phone"),
         QT_TRANSLATE_NOOP("Presets", "Small pictures for small screens (H.264 up to 720 lines, AAC).")},
-    PresetWords{"archive", QT_TRANSLATE_NOOP("Presets", "Archive"),
-                QT_TRANSLATE_NOOP(
-                    "Presets", "Lossless, but for colours finer than 4:2:0; very large files (FFV1, FLAC).")},
+    PresetWords{
+        "archive", QT_TRANSLATE_NOOP("Presets", "Archive"),
+        QT_TRANSLATE_NOOP(
+            "Presets",
+            "Lossless up to 10 bits, but for colours finer than 4:2:0; very large files (FFV1, FLAC).")},
     PresetWords{"sound", QT_TRANSLATE_NOOP("Presets", "Sound alone"),
                 QT_TRANSLATE_NOOP("Presets", "Leaves the pictures out (AAC).")},
     PresetWords{

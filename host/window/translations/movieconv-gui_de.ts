@@ -930,6 +930,14 @@
         <translation>die Bilder mit %1 Bit bekamen 8</translation>
     </message>
     <message>
+        <source>interlaced pictures stayed as they are, in files that do not tell it</source>
+        <translation>Halbbilder blieben, wie sie sind, in Dateien, die es nicht sagen</translation>
+    </message>
+    <message>
+        <source>its pictures of %1 bits got 10</source>
+        <translation>die Bilder mit %1 Bit bekamen 10</translation>
+    </message>
+    <message>
         <source>its %1 pictures keep their colours at half the resolution (4:2:0)</source>
         <translation>die Bilder in %1 behalten ihre Farben in halber Auflösung (4:2:0)</translation>
     </message>
@@ -1156,8 +1164,8 @@
         <translation>Archiv</translation>
     </message>
     <message>
-        <source>Lossless, but for colours finer than 4:2:0; very large files (FFV1, FLAC).</source>
-        <translation>Verlustfrei, außer bei Farben, die feiner sind als 4:2:0; sehr große Dateien (FFV1, FLAC).</translation>
+        <source>Lossless up to 10 bits, but for colours finer than 4:2:0; very large files (FFV1, FLAC).</source>
+        <translation>Verlustfrei bis 10 Bit, außer bei Farben, die feiner sind als 4:2:0; sehr große Dateien (FFV1, FLAC).</translation>
     </message>
     <message>
         <source>Classic</source>
