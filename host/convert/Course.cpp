@@ -6,6 +6,7 @@
 #include "host/convert/Judgement.h"
 #include "host/convert/Room.h"
 #include "host/convert/SizePlan.h"
+#include "host/convert/SoundLoss.h"
 #include "host/convert/Timecode.h"
 #include "host/source/MediaTime.h"
 #include "text/FileNames.h"
@@ -21,6 +22,7 @@
 #include <fmt/format.h>
 #include <limits>
 #include <string_view>
+#include <utility>
 
 namespace movieconv {
 namespace {
@@ -384,7 +386,12 @@ std::string Course::WhyItEndedEarly() const {
 }
 
 void Course::ReportComplaints() {
-    for (const std::string& complaint : movie_.Complaints())
+    EncodeParam param{};
+    MCGetEncodeParam(engine_.get(), &param);
+    std::vector<std::string> complaints = TellSoundLoss(movie_.Info(), request_, param);
+    for (std::string& complaint : movie_.Complaints())
+        complaints.push_back(std::move(complaint));
+    for (const std::string& complaint : complaints)
         observer_.Warned({Warning::Kind::kSource, fmt::format("\"{}\": {}", request_.input, complaint)});
 }
 

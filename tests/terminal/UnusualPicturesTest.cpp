@@ -104,6 +104,44 @@ TEST(UnusualPictures, RgbIsShownInItsColoursByWhatTheOutputSays) {
     }
 }
 
+TEST(UnusualPictures, WhatTheOutputCannotHoldIsTold) {
+    const Args tones = Words("-f lavfi -i anullsrc=cl=7.1:r=192000:d=0.2 -c:a flac");
+    const Args interlaced = Words("-vf setfield=tff -c:v libx264 -flags +ilme+ildct");
+    const std::string deep =
+        Make("12-bits.mkv", Join(CountedPictures(0.2), Words("-c:v ffv1 -pix_fmt yuv420p12")));
+    const std::string fields = Make("fields.mkv", Join(CountedPictures(0.2), interlaced));
+    const std::string wide = Make("wide-sound.mka", tones);
+    const struct {
+        std::string source;
+        Args options;
+        const char* output;
+        std::string told; // all of it
+    } cases[] = {
+        {deep, {"--preset", "archive"}, "o.mkv", "its pictures of 12 bits got 10"},
+        {deep, {"--preset", "standard"}, "o.mkv", "its pictures of 12 bits got 8"},
+        {fields,
+         {"--deinterlace", "off"},
+         "o.mkv",
+         "interlaced pictures stayed as they are, in files that do not tell it"},
+        {wide, {}, "o.mp3", "its 7.1 sound became stereo, its sound of 192000 Hz got 48000"},
+        {wide, {"--channels", "2", "--sample-rate", "48000"}, "o.mp3", ""},
+        {wide, {"--audio-codec", "PCM"}, "o.wav", ""},
+    };
+    for (const auto& test : cases) {
+        SCOPED_TRACE(testing::Message() << test.output << ' ' << test.told);
+        const Folder folder;
+        const Result result = Call(Join(test.options, Args{test.source, folder / test.output}));
+        ASSERT_EQ(result.code, 0) << result.err;
+        std::string told;
+        const std::string mark = "\"" + test.source + "\": ";
+        for (std::size_t at = 0; (at = result.err.find(mark, at)) != std::string::npos;) {
+            at += mark.size();
+            told += (told.empty() ? "" : ", ") + result.err.substr(at, result.err.find('\n', at) - at);
+        }
+        EXPECT_EQ(told, test.told) << result.err;
+    }
+}
+
 /// The middle pixel of the first picture, as "1bbd3a".
 std::string ColourOf(const std::string& path) {
     const Result pixel = program::Run({"ffmpeg", "-v", "error", "-nostdin", "-i", path, "-frames:v", "1",

@@ -938,6 +938,14 @@
         <translation>die Bilder mit %1 Bit bekamen 10</translation>
     </message>
     <message>
+        <source>its %1 sound became %2</source>
+        <translation>der Ton in %1 wurde %2</translation>
+    </message>
+    <message>
+        <source>its sound of %1 Hz got %2</source>
+        <translation>der Ton mit %1 Hz bekam %2</translation>
+    </message>
+    <message>
         <source>its %1 pictures keep their colours at half the resolution (4:2:0)</source>
         <translation>die Bilder in %1 behalten ihre Farben in halber Auflösung (4:2:0)</translation>
     </message>
