@@ -1,6 +1,7 @@
 #include "host/terminal/OptionChecks.h"
 
 #include "host/convert/Failure.h"
+#include "host/source/BurnWish.h"
 
 #include <initializer_list>
 
@@ -51,6 +52,9 @@ void CheckPieces(const Options& options) {
         {options.jobs && options.task != Task::kConvert,
          "--jobs goes with a conversion, not with --plan, --piece or --join"},
         {options.resume && !options.jobs && !options.request.split, "--resume goes with --jobs or --split"},
+        {options.keepPieces && ((!options.jobs && options.task != Task::kJoin) || options.into),
+         "--keep-pieces goes with --jobs or --join"},
+        {options.preview && options.task != Task::kConvert, "--preview goes with a conversion"},
         {options.jobs && options.preview, "--jobs converts many places at once and so excludes --preview"},
     });
 }
@@ -60,8 +64,27 @@ void CheckRequest(const Request& request) {
     const bool rated = request.quality || request.videoRate || request.audioRate;
     const bool changesSound =
         request.channels || request.sampleRate || request.audioRate || request.audioMaxRate;
+    const bool changesPictures = request.videoCodec || request.size || request.detectCrop ||
+                                 !request.crop.CutsNothing() || request.depth || request.frameRate ||
+                                 request.quality || request.videoRate || request.videoMaxRate;
+    BurnWish burnt;
+    burnt.what = request.burnSubtitles;
+    const bool readsText =
+        !request.subtitleFiles.empty() || (!request.burnSubtitles.empty() && !NamesStream(burnt));
     Require({
         {request.noVideo && silent, "--no-video and --no-audio together leave nothing to convert"},
+        {request.noVideo && changesPictures,
+         "--no-video leaves the pictures out: it excludes --video-codec, --size, --crop, --depth, "
+         "--frame-rate, --quality, --video-rate and --video-max-rate"},
+        {request.noAudio && (changesSound || request.audioCodec || request.copySound),
+         "--no-audio leaves the sound out: it excludes --audio-codec, --channels, --sample-rate, "
+         "--audio-rate and --audio-max-rate"},
+        {request.videoRate && request.videoMaxRate && *request.videoMaxRate < *request.videoRate,
+         "--video-max-rate must be at least --video-rate"},
+        {request.audioRate && request.audioMaxRate && *request.audioMaxRate < *request.audioRate,
+         "--audio-max-rate must be at least --audio-rate"},
+        {!request.subtitleCharset.empty() && !readsText,
+         "--subtitle-charset goes with --subtitle-file, or with a file for --burn-subtitles"},
         {request.maxSize && (rated || request.split),
          "--max-size chooses the rates of one file: it excludes --quality, --video-rate, --audio-rate and "
          "--split"},

@@ -23,7 +23,7 @@ void AddRate(OptionGroup& group, const std::string& name, std::optional<int32_t>
 }
 
 void AddRange(CLI::App& app, Options& options) {
-    OptionGroup group(app, "What to convert");
+    OptionGroup group(app, heading::kRange);
     Request& request = options.request;
     group.Parsed("--begin", "TIME", ParseTime, request.begin, kTime,
                  "Begin here; TIME is seconds or h:mm:ss.fff");
@@ -37,7 +37,7 @@ void AddRange(CLI::App& app, Options& options) {
 }
 
 void AddEncoding(CLI::App& app, Options& options) {
-    OptionGroup group(app, "Format and codecs");
+    OptionGroup group(app, heading::kEncoding);
     Request& request = options.request;
     group.Value("--preset", "PRESET", options.preset,
                 "What is not told by other options, by name or from a\nJSON file (default standard)");
@@ -56,7 +56,7 @@ void AddEncoding(CLI::App& app, Options& options) {
 }
 
 void AddPictures(CLI::App& app, Options& options) {
-    OptionGroup group(app, "Pictures");
+    OptionGroup group(app, heading::kPictures);
     Request& request = options.request;
     group.Parsed("--size", "WxH", ParseSize, request.size,
                  fmt::format("a size from 2x2 to {0}x{0}, such as 640x360", kLargestSide),
@@ -93,7 +93,7 @@ void AddPictures(CLI::App& app, Options& options) {
 }
 
 void AddSound(CLI::App& app, Options& options) {
-    OptionGroup group(app, "Sound");
+    OptionGroup group(app, heading::kSound);
     Request& request = options.request;
     group.Number("--channels", "N", 1, 8, request.channels, "Channels; by default the source's");
     group.Number("--sample-rate", "HZ", 4000, 384000, request.sampleRate,
@@ -105,7 +105,7 @@ void AddSound(CLI::App& app, Options& options) {
 }
 
 void AddMany(CLI::App& app, Options& options) {
-    OptionGroup group(app, "Many movies");
+    OptionGroup group(app, heading::kMany);
     group.Value("--into", "FOLDER", options.into,
                 "Convert every INPUT, files and folders of them, into\nthis folder; what is there already is "
                 "left");
@@ -113,7 +113,7 @@ void AddMany(CLI::App& app, Options& options) {
 }
 
 void AddPieces(CLI::App& app, Options& options) {
-    OptionGroup group(app, "In pieces");
+    OptionGroup group(app, heading::kPieces);
     group.Parsed("--jobs", "N", ParseJobs, options.jobs,
                  fmt::format("a number from 1 to {}, or auto", kMostJobs),
                  "Convert in pieces, N at once; auto: as many as pay");
@@ -148,7 +148,7 @@ void AddTracks(OptionGroup& group, const std::string& name, TrackList& list, con
 }
 
 void AddCarried(CLI::App& app, Options& options) {
-    OptionGroup group(app, "Tracks and texts");
+    OptionGroup group(app, heading::kCarried);
     Request& request = options.request;
     AddTracks(group, "--audio-tracks", request.audioTracks,
               "Sound to convert, by numbers as --info shows them or\nby languages, between commas");
@@ -173,7 +173,7 @@ void AddCarried(CLI::App& app, Options& options) {
 }
 
 void AddOutput(CLI::App& app, Options& options) {
-    OptionGroup group(app, "Output");
+    OptionGroup group(app, heading::kOutput);
     Request& request = options.request;
     group.Flag("-y,--overwrite", request.overwrite, "Replace an existing output; by default it is refused");
     group.Choice<OnFull>("--on-full", request.onFull, {{"stop", OnFull::kStop}, {"wait", OnFull::kWait}},
@@ -188,7 +188,7 @@ void AddOutput(CLI::App& app, Options& options) {
 }
 
 void AddReports(CLI::App& app, Options& options) {
-    OptionGroup group(app, "Reports");
+    OptionGroup group(app, heading::kReports);
     group.Choice<ProgressStyle>(
         "--progress", options.progress,
         {{"bar", ProgressStyle::kBar}, {"json", ProgressStyle::kJson}, {"none", ProgressStyle::kNone}},
@@ -199,7 +199,7 @@ void AddReports(CLI::App& app, Options& options) {
 }
 
 void AddTasks(CLI::App& app, Options& options) {
-    OptionGroup group(app, kInsteadOfConverting);
+    OptionGroup group(app, heading::kInsteadOfConverting);
     const auto add = [&](const std::string& name, Task task, const std::string& help) {
         group.Action(
             name, [&options, task] { options.task = task; }, help);

@@ -10,8 +10,19 @@ class App;
 
 namespace movieconv {
 
-/// The heading of what only prints.
-constexpr const char* kInsteadOfConverting = "Instead of converting";
+/// The headings under which --help has the options.
+namespace heading {
+constexpr const char* kRange = "What to convert";
+constexpr const char* kEncoding = "Format and codecs";
+constexpr const char* kPictures = "Pictures";
+constexpr const char* kSound = "Sound";
+constexpr const char* kMany = "Many movies";
+constexpr const char* kPieces = "In pieces";
+constexpr const char* kCarried = "Tracks and texts";
+constexpr const char* kOutput = "Output";
+constexpr const char* kReports = "Reports";
+constexpr const char* kInsteadOfConverting = "Instead of converting"; // what only prints
+} // namespace heading
 
 /// Adds all options but those for help and the version: parsing then fills `options`, which has to stay until
 /// that is done.

@@ -6,6 +6,7 @@
 #include "host/terminal/Help.h"
 #include "host/terminal/OptionChecks.h"
 #include "host/terminal/OptionTable.h"
+#include "host/terminal/TaskChecks.h"
 
 #include <CLI/CLI.hpp>
 #include <cerrno>
@@ -70,10 +71,10 @@ std::optional<Options> ParseOptions(int argc, char** argv) {
     app.footer("A name that begins with a dash goes behind \"--\". While converting, space or p\n"
                "pauses and resumes, q or Ctrl-C stops and keeps what is done as a playable file.\n"
                "movieconv(1) tells more, with the presets and the exit codes.");
-    app.set_help_flag("-h,--help", "Print help on the usual options")->group(kInsteadOfConverting);
-    app.set_help_all_flag("--help-all", "Print help on all options")->group(kInsteadOfConverting);
+    app.set_help_flag("-h,--help", "Print help on the usual options")->group(heading::kInsteadOfConverting);
+    app.set_help_all_flag("--help-all", "Print help on all options")->group(heading::kInsteadOfConverting);
     app.set_version_flag("--version", Version, "Print the version and the colour routines' level")
-        ->group(kInsteadOfConverting);
+        ->group(heading::kInsteadOfConverting);
     AddOptions(app, options);
     try {
         app.parse(argc, argv);
@@ -84,6 +85,7 @@ std::optional<Options> ParseOptions(int argc, char** argv) {
     } catch (const CLI::ParseError& error) {
         throw Failure(Category::kRequest, fmt::format("{}; try \"movieconv --help\"", error.what()));
     }
+    CheckTask(app);
     if (options.completion) {
         std::fputs(CompletionScript(*options.completion, OptionEntries(app)).c_str(), stdout);
         RequirePrinted();

@@ -8,6 +8,7 @@
 #include <gtest/gtest.h>
 #include <pty.h>
 #include <regex.h>
+#include <set>
 #include <sys/wait.h>
 #include <termios.h>
 #include <unistd.h>
@@ -25,9 +26,10 @@ namespace {
 }
 
 std::vector<std::string> Movieconv(std::vector<std::string> arguments) {
-    const bool convertsByItself =
-        std::none_of(arguments.begin(), arguments.end(),
-                     [](const std::string& one) { return one == "--preset" || one == "--show-preset"; });
+    const std::set<std::string> others{"--preset", "--piece",        "--join",         "--show-preset",
+                                       "--info",   "--list-formats", "--list-presets", "--completion"};
+    const bool convertsByItself = std::none_of(arguments.begin(), arguments.end(),
+                                               [&](const std::string& one) { return others.count(one) > 0; });
     if (convertsByItself && !arguments.empty())
         arguments.insert(arguments.begin(), {"--preset", "classic"});
     arguments.insert(arguments.begin(), MOVIECONV_PROGRAM);

@@ -101,6 +101,21 @@ TEST(Program, RefusesAndLeavesEverythingAsItWas) {
         {{source}, 2, "OUTPUT"},
         {{}, 2, "INPUT"},
         {{"--nonsense"}, 2, "--help"},
+        {{"--info", "--list-formats", source}, 2, "--info and --list-formats exclude each other"},
+        {{"--estimate", "--info", source, "o.mp4"}, 2, "--info and --estimate exclude each other"},
+        {{"--piece", "0", "--size", "100x100", "x.plan"}, 2, "--size does not go with --piece"},
+        {{"--join", "-f", "mkv", "x.plan"}, 2, "--format does not go with --join"},
+        {{"--list-presets", "--channels", "2"}, 2, "--channels does not go with --list-presets"},
+        {{"--plan", folder / "p", source, folder / "o.mp4", "--preview", "p.png"}, 2, "--preview goes"},
+        {{source, folder / "out.mp4", "--keep-pieces"}, 2, "--keep-pieces goes with"},
+        {{source, folder / "out.mp4", "--subtitle-charset", "NOSUCH"}, 2, "--subtitle-charset goes with"},
+        {{source, folder / "out.m4a", "--no-video", "--size", "64x64"}, 2, "--no-video leaves"},
+        {{source, folder / "out.mp4", "--no-audio", "--channels", "1"}, 2, "--no-audio leaves"},
+        {{source, folder / "out.mp4", "--video-rate", "1M", "--video-max-rate", "1k"}, 2, "at least"},
+        {{source, folder / "out.mp4", "--audio-rate", "1M", "--audio-max-rate", "1k"}, 2, "at least"},
+        {{source, folder / "out.mp4", "--audio-tracks", ""}, 2, "--audio-tracks has an empty value"},
+        {{source, folder / "out.mp4", "--burn-subtitles", ""}, 2, "--burn-subtitles has an empty value"},
+        {{source, folder / "out.mp4", "--subtitle-file", ""}, 2, "--subtitle-file has an empty value"},
     };
     for (const auto& refusal : refusals) {
         const Result result = Call(refusal.arguments);
