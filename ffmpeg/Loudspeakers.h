@@ -28,7 +28,8 @@ inline uint64_t SpeakersFor(int channels, uint64_t speakers) {
     return std::popcount(speakers) == channels ? speakers : UsualSpeakers(channels);
 }
 
-/// The same for layouts that are heard alike: surround loudspeakers are at the side or behind.
+/// The same for layouts that are heard alike: surround loudspeakers are at the side or behind, and a channel
+/// that is alone is mono, whichever it is.
 inline uint64_t AlikeSpeakers(uint64_t speakers) {
     constexpr uint64_t kSides = AV_CH_SIDE_LEFT | AV_CH_SIDE_RIGHT;
     constexpr uint64_t kBacks = AV_CH_BACK_LEFT | AV_CH_BACK_RIGHT;
@@ -37,6 +38,8 @@ inline uint64_t AlikeSpeakers(uint64_t speakers) {
         speakers ^= kSides | kBacks;
     if (speakers == kMixed)
         speakers = AV_CH_LAYOUT_STEREO;
+    if (std::has_single_bit(speakers))
+        speakers = AV_CH_LAYOUT_MONO;
     return speakers;
 }
 

@@ -88,7 +88,11 @@ constexpr std::array<uint64_t, 9> kUsualLayouts{ // where only their number is t
 constexpr std::array<uint64_t, 10> kAacLayouts{
     AV_CH_LAYOUT_MONO, AV_CH_LAYOUT_STEREO, AV_CH_LAYOUT_2POINT1, AV_CH_LAYOUT_SURROUND, AV_CH_LAYOUT_4POINT0,
     AV_CH_LAYOUT_QUAD, AV_CH_LAYOUT_5POINT0_BACK, AV_CH_LAYOUT_5POINT1_BACK, AV_CH_LAYOUT_7POINT1, 0};
-constexpr std::array<uint64_t, 9> kXiphLayouts{
+// FFmpeg's encoder for Opus interchanges the channels of 5.0 and 6.1.
+constexpr std::array<uint64_t, 7> kOpusLayouts{
+    AV_CH_LAYOUT_MONO, AV_CH_LAYOUT_STEREO, AV_CH_LAYOUT_SURROUND, AV_CH_LAYOUT_QUAD, AV_CH_LAYOUT_5POINT1_BACK,
+    AV_CH_LAYOUT_7POINT1, 0};
+constexpr std::array<uint64_t, 9> kVorbisLayouts{
     AV_CH_LAYOUT_MONO, AV_CH_LAYOUT_STEREO, AV_CH_LAYOUT_SURROUND, AV_CH_LAYOUT_QUAD, AV_CH_LAYOUT_5POINT0_BACK,
     AV_CH_LAYOUT_5POINT1_BACK, AV_CH_LAYOUT_6POINT1, AV_CH_LAYOUT_7POINT1, 0};
 constexpr std::array<uint64_t, 9> kFlacLayouts{
@@ -102,8 +106,8 @@ constexpr std::array kSoundCodecs{
     SoundCodec{kFlac,   AV_CODEC_ID_FLAC,      "flac",       8, 0.0, 0.0},
     SoundCodec{kAlac,   AV_CODEC_ID_ALAC,      "alac",       8, 0.0, 0.0},
     SoundCodec{kMp2,    AV_CODEC_ID_MP2,       "mp2",        2, 0.3, 8.0},
-    SoundCodec{kOpus,   AV_CODEC_ID_OPUS,      "libopus",    8, 0.2, 5.3, 0, kXiphLayouts.data()},
-    SoundCodec{kVorbis, AV_CODEC_ID_VORBIS,    "libvorbis",  8, 1.0, 3.8, 48000, kXiphLayouts.data()},
+    SoundCodec{kOpus,   AV_CODEC_ID_OPUS,      "libopus",    8, 0.2, 5.3, 0, kOpusLayouts.data()},
+    SoundCodec{kVorbis, AV_CODEC_ID_VORBIS,    "libvorbis",  8, 1.0, 3.8, 48000, kVorbisLayouts.data()},
     SoundCodec{kPcm,    AV_CODEC_ID_PCM_S16LE, "pcm_s16le",  8, 0.0, 0.0},
 };
 

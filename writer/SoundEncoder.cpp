@@ -63,8 +63,10 @@ int Kept(uint64_t layout, uint64_t wanted) {
 }
 
 /// The layout that is asked for, or the one of those at hand that keeps most of it, with the fewest channels.
+/// Other loudspeakers may stay silent in it, unless a number of channels is asked for.
 void ChooseLayout(const AVCodec& codec, const SoundSettings& settings, int most, AVChannelLayout& layout) {
-    const int channels = std::min(settings.channels, most);
+    const bool isSources = std::popcount(settings.speakers) == settings.channels;
+    const int channels = isSources ? most : std::min(settings.channels, most);
     uint64_t wanted = av::SpeakersFor(settings.channels, settings.speakers);
     if (wanted == 0)
         wanted = av::UsualSpeakers(channels);

@@ -336,15 +336,16 @@ TEST(Decoders, GiveWhatIsWholeBehindDamageAtTheEnd) {
 }
 
 TEST(Decoders, BringSoundToTheLoudspeakersThatItBeganWith) {
-    const auto tone = [](const char* layout, const char* channels) {
-        return Make(std::string("centre-") + layout + ".ac3",
+    const auto tone = [](const char* layout, const char* channels, const char* seconds) {
+        return Make(std::string("centre-") + layout + "-" + seconds + ".ac3",
                     {"-f", "lavfi", "-i",
-                     std::string("aevalsrc=") + channels + ":c=" + layout + ":s=48000:d=1", "-c:a", "ac3"});
+                     std::string("aevalsrc=") + channels + ":c=" + layout + ":s=48000:d=" + seconds, "-c:a",
+                     "ac3"});
     };
     // The centre sounds in the second half, which is the third channel there, and none in the first half.
-    const std::string first = ReadFile(tone("3.0(back)", "0|0|0"));
+    const std::string first = ReadFile(tone("3.0(back)", "0|0|0", "4"));
     const Folder folder;
-    WriteFile(folder / "changes.ac3", first + ReadFile(tone("3.0", "0|0|sin(880*PI*t)/2")));
+    WriteFile(folder / "changes.ac3", first + ReadFile(tone("3.0", "0|0|sin(880*PI*t)/2", "1")));
     Movie movie(folder / "changes.ac3", {});
     ASSERT_EQ(movie.Info().sound->channels, 3);
     std::array<int, 3> loudest{};
