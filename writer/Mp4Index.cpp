@@ -1,5 +1,6 @@
 #include "writer/Mp4Index.h"
 
+#include "media/MediaRecords.h"
 #include "writer/BigEndian.h"
 #include "writer/WriterFailure.h"
 #include "writer/WriterStatus.h"
@@ -30,6 +31,12 @@ size_t FindMoov(const std::vector<uint8_t>& kept) {
             return begin;
     }
     throw WriterFailure(kWriterErrorEncode, "The container has no index.");
+}
+
+/// The multiplexer's own.
+uint32_t InMovieUnits(int64_t ticks) {
+    constexpr int kUnitsPerSecond = 1000;
+    return static_cast<uint32_t>(av_rescale(ticks, kUnitsPerSecond, kTicksPerSecond));
 }
 
 bool HasTimecode(const Extras& extras) {
@@ -195,6 +202,8 @@ Mp4Index::Result Mp4Index::Finish() {
     const size_t moov = FindMoov(kept);
     Result result{{}, std::vector<uint8_t>(kept.begin() + static_cast<std::ptrdiff_t>(moov), kept.end())};
     CorrectTracks(result.moov, tracks_);
+    if (!extras_.chapters.empty() && extras_.chapters.front().begin > 0)
+        DelayChapters(result.moov, tracks_.size(), InMovieUnits(extras_.chapters.front().begin));
     kept.resize(moov);
     result.texts = std::move(head_);
     result.texts.insert(result.texts.end(), kept.begin(), kept.end());

@@ -3,6 +3,7 @@
 #ifndef MOVIECONV_WRITER_MP4TRACKS_H
 #define MOVIECONV_WRITER_MP4TRACKS_H
 
+#include <cstddef>
 #include <cstdint>
 #include <string>
 #include <vector>
@@ -19,6 +20,10 @@ struct Mp4Track {
 /// multiplexer writes QuickTime's numbers, of which most languages have none. It lets the first
 /// subtitles be shown where none are meant to be, and does not know language tags.
 void CorrectTracks(std::vector<uint8_t>& moov, const std::vector<Mp4Track>& tracks);
+
+/// Lets the chapters begin at `begin`, in the movie's units, where the multiplexer has them begin at 0: their
+/// track is the first one of texts behind the `tracks` first ones.
+void DelayChapters(std::vector<uint8_t>& moov, size_t tracks, uint32_t begin);
 
 } // namespace writer
 

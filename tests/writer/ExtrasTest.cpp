@@ -175,6 +175,36 @@ TEST_F(Extras, ChaptersFollowTheSourceIntoAClip) {
     }
 }
 
+// Which MP4 has in a track of texts, and the multiplexer from 0 on.
+TEST_F(Extras, ChaptersBeginWhereTheFirstOneDoes) {
+    const std::vector<std::vector<int>> cases{// milliseconds
+                                              {500, 1500},
+                                              {300, 1000, 1200},
+                                              {200, 400, 800, 1000, 1200}};
+    for (const auto& borders : cases) {
+        for (const char* code : {"MP4 ", "MOV ", "M4A "}) {
+            SCOPED_TRACE(code + std::to_string(borders.size()));
+            const RegisteredOptions options{WriterOptions{}};
+            movie_.Use(options);
+            const FileFormatInfo* format = MWGetFileFormatInfos();
+            while (format->fccFormat != FourCC(code[0], code[1], code[2], code[3]))
+                ++format;
+            Choose(*format);
+            for (size_t i = 1; i < borders.size(); ++i)
+                MWAddChapter(options.Set(), borders[i - 1] * kSecond / 1000, borders[i] * kSecond / 1000,
+                             "A");
+            ASSERT_TRUE(movie_.Write(path_)) << Latest(options.Set()).szWhat;
+            const ReadExtras read = ReadExtrasOf(path_);
+            ASSERT_EQ(read.chapters.size(), borders.size() - 1);
+            for (size_t i = 1; i < borders.size(); ++i) {
+                EXPECT_NEAR(read.chapters[i - 1].begin, borders[i - 1] / 1000.0, 1e-6);
+                EXPECT_NEAR(read.chapters[i - 1].end, borders[i] / 1000.0, 1e-6);
+            }
+            EXPECT_FALSE(ReadMovieFile(path_).firstChannel.empty());
+        }
+    }
+}
+
 TEST_F(Extras, FlagsOfSoundAreWhereTheTableHasThem) {
     for (const FileFormatInfo* format = MWGetFileFormatInfos(); format->fccFormat != 0; ++format) {
         Choose(*format);
