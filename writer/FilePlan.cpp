@@ -279,6 +279,14 @@ int64_t IndexSize(const FilePlan& plan, const VideoFormat* video, const AudioFor
 
 } // namespace
 
+int64_t PicturePlan::StayOf(const VideoImage& image) const {
+    const int64_t told = image.nDuration;
+    if (!keepStamps) // on the grid a shorter one might not be seen at all
+        return std::max(pictureLength, told);
+    const bool countsPictures = clock.ticksPerPicture == 1; // and is made longer only where that pays
+    return told <= 0 || (countsPictures && told - pictureLength <= kTicksPerSecond) ? pictureLength : told;
+}
+
 FilePlan MakeFilePlan(const EncodeParam& param, const VideoFormat* video, const AudioFormat* audio,
                       const WriterOptions& options, const Extras& extras) {
     FilePlan plan{};

@@ -34,6 +34,9 @@ struct PicturePlan {
     /// comes.
     std::optional<int64_t> tickBefore;
     std::optional<int64_t> end;
+
+    /// How long a picture stays that none follows, in 100 ns units.
+    int64_t StayOf(const VideoImage& image) const;
 };
 
 struct SoundPlan {

@@ -124,19 +124,21 @@ bool IsText(const PacketWriter& written, int stream) {
 }
 
 /// Calls `take` with all packets. In fragments a picture lasts until the next one is decoded, which may be
-/// long after the last one was shown.
+/// long after the last one was shown, or long before that one ends.
 void ForEachPacket(const FragmentLog& log, const PacketWriter& written,
                    const std::function<void(const PlacedPacket&)>& take) {
-    std::vector<int64_t> ends;
+    std::vector<PacketWriter::Written> streams;
     for (int stream = 0; stream < written.StreamCount(); ++stream) {
-        const PacketWriter::Written taken = written.Stream(stream);
-        ends.push_back(taken.end + taken.delay);
+        streams.push_back(written.Stream(stream));
     }
     log.ForEach([&](PlacedPacket packet) {
-        if (packet.stream < 0 || static_cast<size_t>(packet.stream) >= ends.size())
+        if (packet.stream < 0 || static_cast<size_t>(packet.stream) >= streams.size())
             ThrowIncomplete();
-        if (const int64_t left = ends[static_cast<size_t>(packet.stream)] - packet.pts; left > 0)
-            packet.duration = std::min(packet.duration, left);
+        const PacketWriter::Written& stream = streams[static_cast<size_t>(packet.stream)];
+        const bool isLast = stream.description.parameters->codec_type == AVMEDIA_TYPE_VIDEO &&
+                            packet.pts == stream.last + stream.delay;
+        if (const int64_t left = stream.end + stream.delay - packet.pts; left > 0)
+            packet.duration = isLast ? left : std::min(packet.duration, left);
         take(packet);
     });
 }

@@ -114,11 +114,11 @@ void MediaFile::OpenStages() {
 void MediaFile::StartPictures() {
     if (!pictures_)
         return;
-    const auto shown = [this](int64_t count) {
-        record_->Update([count](WriterStatus& status) {
+    const auto shown = [this](int64_t count, int64_t repeats) {
+        record_->Update([count, repeats](WriterStatus& status) {
             status.llPicturesWritten += count;
             status.llPicturesDropped += count == 0 ? 1 : 0;
-            status.llPicturesRepeated += std::max<int64_t>(0, count - 1);
+            status.llPicturesRepeated += repeats;
         });
     };
     pictures_->Start([this](AVPacket& packet) { part_.Write(packet, pictureStream_); }, shown,
@@ -134,6 +134,7 @@ bool MediaFile::WriteVideo(const VideoImage& image) {
     }
     const int64_t begin = plan_.piece == kWriterPiecePictures ? record_->Options().llPieceBegin : 0;
     const int64_t time = begin + stamps_.AddPicture(image.llTime);
+    const int64_t stay = plan_.pictures->StayOf(image);
     if (!firstPicture_) {
         firstPicture_ = time;
         pictureSource_ = SourceTime(image.reserved);
@@ -144,14 +145,13 @@ bool MediaFile::WriteVideo(const VideoImage& image) {
             return;
         ++status.llPicturesReceived;
         status.llStampsRepaired = stamps_.Repairs();
-        status.dVideoReceived =
-            static_cast<double>(time - *firstPicture_ + plan_.pictures->pictureLength) / kTicksPerSecond;
+        status.dVideoReceived = static_cast<double>(time - *firstPicture_ + stay) / kTicksPerSecond;
     });
     try {
         StartSoundIfKnown();
         StartBeside();
         beside_.Reach(time + SourceBegin());
-        return !pictures_ || pictures_->Push(image, time);
+        return !pictures_ || pictures_->Push(image, time, stay);
     } catch (...) {
         Fail(std::current_exception());
         return false;

@@ -13,6 +13,7 @@ extern "C" {
 #include <iterator>
 #include <new>
 #include <string>
+#include <string_view>
 #include <utility>
 
 namespace writer {
@@ -270,10 +271,22 @@ bool Muxer::Describable() const {
     });
 }
 
+/// The multiplexer for GIF knows how long a picture stays from the next one.
+void Muxer::TellLastStay() {
+    constexpr int64_t kLongest = UINT16_MAX;
+    if (std::string_view(container_.muxer) != "gif")
+        return;
+    const State& state = streams_.front();
+    const int64_t stay =
+        av_rescale_q(state.endPts - state.lastPts, state.unit, output_->streams[0]->time_base);
+    SetOption(*output_, "final_delay", std::to_string(std::min(stay, kLongest)));
+}
+
 void Muxer::WriteTrailer() {
     const Turn turn(*this);
     if (std::exchange(ended_, true))
         return;
+    TellLastStay();
     Check(av_write_trailer(output_.get()), "cannot be finished");
     SetLanguageTags();
     finished_ = true;
@@ -290,6 +303,7 @@ Muxer::Written Muxer::Stream(int stream) const {
             state.delay,
             state.packets,
             av_rescale_q(state.endPts, state.unit, out->time_base),
+            av_rescale_q(state.lastPts, state.unit, out->time_base),
             static_cast<double>(std::max<int64_t>(0, length)) * av_q2d(state.unit)};
 }
 
@@ -301,8 +315,9 @@ bool Muxer::Empty() const {
 
 void Muxer::NoteTimes(State& state, const AVPacket& packet) {
     if (!std::exchange(state.begun, true))
-        state.firstPts = state.endPts = packet.pts;
+        state.firstPts = state.endPts = state.lastPts = packet.pts;
     state.firstPts = std::min(state.firstPts, packet.pts);
+    state.lastPts = std::max(state.lastPts, packet.pts);
     state.endPts = std::max(state.endPts, packet.pts + packet.duration);
 }
 

@@ -77,8 +77,9 @@ private:
         int64_t lastDts = AV_NOPTS_VALUE;
         int64_t packets = 0;
         bool begun = false;
-        int64_t firstPts = 0; ///< In the stream's own unit, as endPts.
+        int64_t firstPts = 0; ///< In the stream's own unit, as those below.
         int64_t endPts = 0;
+        int64_t lastPts = 0;
     };
 
     class Turn;
@@ -87,6 +88,7 @@ private:
     void Check(int result, const char* what) const;
     void SetOptions(int64_t room);
     void SetDelays();
+    void TellLastStay();
     int64_t MostApart(int packetSize);
     int64_t LeastLag() const;
     void NoteWhole();

@@ -34,6 +34,7 @@ public:
         int64_t delay; ///< By how much times in the file are later than those that came, in that unit.
         int64_t packets;
         int64_t end;    ///< Of the last packet, in that unit, as it came.
+        int64_t last;   ///< When the packet is shown that is shown last, likewise.
         double seconds; ///< From the start of the first packet to the end of the last, without run-up.
     };
 

@@ -140,10 +140,14 @@ PictureEncoder::~PictureEncoder() {
         EndWithABlackPicture(*context_, *packet_);
 }
 
-void PictureEncoder::Encode(AVFrame& frame, int64_t tick, const PacketTaker& take) {
+void PictureEncoder::Encode(AVFrame& frame, int64_t tick, int64_t stay, const PacketTaker& take) {
     if (HasAll())
         return;
     ticks_.push_back(tick);
+    stay_ = stay;
+    if (!waiting_.empty())
+        waiting_.front()->duration = std::min<int64_t>(ticksPerPicture_, tick - waiting_.front()->pts);
+    HandOutWaiting(take);
     frame.pts = nextIndex_++;
     frame.pict_type = AV_PICTURE_TYPE_NONE;
     frame.quality = context_->global_quality;
@@ -170,6 +174,11 @@ void PictureEncoder::Finish(const PacketTaker& take) {
     SendHeld(take);
     if (HasBegun() && !HasAll())
         Send(nullptr, take);
+    // Where a file knows only how long it is until the next picture is decoded, the one decoded last tells
+    // it.
+    if (!cut_ && !waiting_.empty())
+        waiting_.back()->duration = stay_;
+    HandOutWaiting(take);
 }
 
 /// Whether a picture has reached the encoder.
@@ -193,14 +202,36 @@ void PictureEncoder::Send(AVFrame* frame, const PacketTaker& take) {
         if (cut_ && packet.pts >= *cut_)
             return;
         ++handedOut_;
+        const bool isLatest = packet.pts == nextIndex_ - 1;
+        packet.duration = StayOf(packet.pts);
         packet.pts = TickOf(packet.pts);
         packet.dts = TickOf(decodingIndex);
-        packet.duration = ticksPerPicture_;
-        take(packet);
+        if (frame == nullptr)
+            HandOutWaiting(take);
+        if (frame == nullptr || isLatest || !waiting_.empty())
+            Wait(packet);
+        else
+            take(packet);
         // Nothing that comes later is decoded or shown before this.
         for (; firstIndex_ < decodingIndex; ++firstIndex_)
             ticks_.pop_front();
     });
+}
+
+void PictureEncoder::Wait(AVPacket& packet) {
+    waiting_.push_back(av::NewPacket());
+    av_packet_move_ref(waiting_.back().get(), &packet);
+}
+
+void PictureEncoder::HandOutWaiting(const PacketTaker& take) {
+    for (; !waiting_.empty(); waiting_.pop_front())
+        take(*waiting_.front());
+}
+
+/// In ticks; of the picture that came last as if it were the movie's.
+int64_t PictureEncoder::StayOf(int64_t index) const {
+    return index == nextIndex_ - 1 ? stay_
+                                   : std::min<int64_t>(ticksPerPicture_, TickOf(index + 1) - TickOf(index));
 }
 
 int64_t PictureEncoder::TickOf(int64_t index) const {

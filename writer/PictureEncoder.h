@@ -45,8 +45,9 @@ public:
     PictureEncoder(const PictureEncoder&) = delete;
     PictureEncoder& operator=(const PictureEncoder&) = delete;
 
-    /// Encodes a picture that is shown from `tick` on; ticks rise. Throws WriterFailure (kWriterErrorEncode).
-    void Encode(AVFrame& frame, int64_t tick, const PacketTaker& take);
+    /// Encodes a picture that is shown from `tick` on; ticks rise. It is shown for `stay` ticks if none
+    /// follows. Throws WriterFailure (kWriterErrorEncode).
+    void Encode(AVFrame& frame, int64_t tick, int64_t stay, const PacketTaker& take);
 
     /// Cuts behind the picture encoded last: what comes now is only looked at, and its packets are not handed
     /// out. Once, and only where the codec looks ahead and `isCut` was told.
@@ -62,12 +63,17 @@ private:
     bool HasAll() const;
     void SendHeld(const PacketTaker& take);
     void Send(AVFrame* frame, const PacketTaker& take);
+    void Wait(AVPacket& packet);
+    void HandOutWaiting(const PacketTaker& take);
+    int64_t StayOf(int64_t index) const;
     int64_t TickOf(int64_t index) const;
 
     const int ticksPerPicture_;
     av::CodecContext context_;
     av::Packet packet_;
-    std::deque<int64_t> ticks_; ///< Ticks of pictures that packets may still name, from firstIndex_ on.
+    int64_t stay_ = 0;               ///< Of the picture that came last, if none follows.
+    std::deque<av::Packet> waiting_; ///< The packet of that picture, and those decoded behind it.
+    std::deque<int64_t> ticks_;      ///< Ticks of pictures that packets may still name, from firstIndex_ on.
     int64_t firstIndex_ = 0;
     int64_t nextIndex_ = 0;
     int64_t handedOut_ = 0;      ///< Packets.

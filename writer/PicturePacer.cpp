@@ -54,6 +54,10 @@ PicturePacer::Showing PicturePacer::Add(int64_t time) {
     return showing;
 }
 
+int64_t PicturePacer::Stay(int64_t tick, int64_t time, int64_t length) const {
+    return std::max<int64_t>(1, PlaceOf(time + length) - tick);
+}
+
 PicturePacer::Showing PicturePacer::Finish(int64_t end, bool more) {
     // A file too short for the grid still shows a picture; otherwise one whose place is the end would only
     // make the file longer.
@@ -73,18 +77,26 @@ int64_t PicturePacer::GridIndex(int64_t time) const {
     return av_rescale_q(time, kUnit, av_inv_q(clock_.rate));
 }
 
-/// Nothing for a picture that is left out: where pictures tell the time, those that come faster than the rate
-/// would make it fall behind the sound.
-std::optional<int64_t> PicturePacer::TickOf(int64_t time) {
+int64_t PicturePacer::PictureLength() const {
+    return av_rescale_q(1, av_inv_q(clock_.rate), kUnit);
+}
+
+/// On the steady grid if it is near.
+int64_t PicturePacer::PlaceOf(int64_t time) const {
     const int64_t steps = GridIndex(time - *origin_);
     const int64_t onGrid = *origin_ + av_rescale_q(steps, av_inv_q(clock_.rate), kUnit);
-    const int64_t length = av_rescale_q(1, av_inv_q(clock_.rate), kUnit);
-    const int64_t tolerance = std::min(kGridTolerance, length / 8);
-    const int64_t value = std::abs(time - onGrid) <= tolerance
-                              ? av_rescale_q(*origin_, kUnit, clock_.tick) + steps * clock_.ticksPerPicture
-                              : av_rescale_q(time, kUnit, clock_.tick);
+    const int64_t tolerance = std::min(kGridTolerance, PictureLength() / 8);
+    return std::abs(time - onGrid) <= tolerance
+               ? av_rescale_q(*origin_, kUnit, clock_.tick) + steps * clock_.ticksPerPicture
+               : av_rescale_q(time, kUnit, clock_.tick);
+}
+
+/// Nothing for a picture that is left out: where pictures tell the time, those that come faster than the rate
+/// would make it fall behind the sound.
+std::optional<int64_t> PicturePacer::TickOf(int64_t time) const {
+    const int64_t value = PlaceOf(time);
     const int64_t tick = lastTick_ ? std::max(value, *lastTick_ + 1) : value;
-    const bool isLate = tick > value && av_rescale_q(tick, clock_.tick, kUnit) - time >= length;
+    const bool isLate = tick > value && av_rescale_q(tick, clock_.tick, kUnit) - time >= PictureLength();
     return clock_.ticksPerPicture == 1 && isLate ? std::nullopt : std::optional(tick);
 }
 

@@ -50,12 +50,18 @@ public:
     /// is answered at once, else that of the picture before.
     Showing Add(int64_t time);
 
+    /// Ticks from `tick`, where Add has put a picture of that time, to the end of its `length`. Where stamps
+    /// are kept.
+    int64_t Stay(int64_t tick, int64_t time, int64_t length) const;
+
     /// Returns the showing of the last picture, which lasts until `end`, if it is still open. `more`: another
     /// picture is shown there, by someone else.
     Showing Finish(int64_t end, bool more = false);
 
 private:
-    std::optional<int64_t> TickOf(int64_t time);
+    int64_t PictureLength() const;
+    int64_t PlaceOf(int64_t time) const;
+    std::optional<int64_t> TickOf(int64_t time) const;
     int64_t GridIndex(int64_t time) const;
     Showing ShowUntil(int64_t index);
 

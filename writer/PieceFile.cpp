@@ -188,6 +188,7 @@ void PieceWriter::Write(AVPacket& packet, int stream) {
     State& state = streams_[static_cast<std::size_t>(stream)];
     ++state.packets;
     state.begin = std::min(state.begin, packet.pts);
+    state.last = std::max(state.last, packet.pts);
     state.end = std::max(state.end, packet.pts + packet.duration);
     AVIOContext& io = *file_.Io();
     avio_w8(&io, kPacket);
@@ -221,7 +222,11 @@ PacketWriter::Written PieceWriter::Stream(int stream) const {
     const State& state = streams_[static_cast<std::size_t>(stream)];
     const int64_t length =
         state.packets > 0 ? state.end - state.begin - state.parameters->initial_padding : 0;
-    return {state.description, 0, state.packets, state.end,
+    return {state.description,
+            0,
+            state.packets,
+            state.end,
+            state.last,
             static_cast<double>(std::max<int64_t>(0, length)) * av_q2d(state.description.unit)};
 }
 

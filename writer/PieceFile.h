@@ -48,6 +48,7 @@ private:
         int64_t packets = 0;
         int64_t begin = INT64_MAX;
         int64_t end = INT64_MIN;
+        int64_t last = INT64_MIN;
     };
 
     AvioFile& file_;

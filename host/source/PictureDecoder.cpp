@@ -118,7 +118,7 @@ bool PictureDecoder::Advance() {
 void PictureDecoder::Run() {
     failures_.Attempt([this] {
         DecodeAll();
-        if (const auto last = stamps_.Finish(); last && held_)
+        if (const auto last = stamps_.Finish(lastStay_.Told(reader_, timeBase_)); last && held_)
             Deliver(*last);
     });
     ranDry_ = !refused_;
@@ -133,6 +133,7 @@ void PictureDecoder::DecodeAll() {
     const auto accept = [this](AVFrame& frame) { return Accept(frame); };
     threads_.Begin();
     while (const av::Packet packet = demuxer_.Take(stream_)) {
+        lastStay_.Add(*packet);
         if (!decoder_->Decode(packet.get(), accept))
             return;
         damaged_ = damagedBefore_ + decoder_->Damaged();
@@ -181,6 +182,8 @@ bool PictureDecoder::Deliver(StampRepair::Stamp stamp) {
         refused_ = true;
         return false;
     }
+    if (end_)
+        stamp.duration = std::min(stamp.duration, *end_ - stamp.time);
     if (begin_ && stamp.time + stamp.duration <= *begin_)
         return true;
     if (const int64_t begin = begin_.value_or(0); first_ && (begin_ || stamp.time > begin)) {

@@ -9,6 +9,7 @@
 #include "host/source/DecodingThreads.h"
 #include "host/source/Demuxer.h"
 #include "host/source/Failures.h"
+#include "host/source/LastStay.h"
 #include "host/source/PictureConverter.h"
 #include "host/source/PictureFilter.h"
 #include "host/source/StampRepair.h"
@@ -43,7 +44,8 @@ public:
     /// it. Where GetCurrentImage may be called.
     std::optional<int64_t> TimeOfNext();
 
-    /// Leaves out the pictures from that time on. Only before the first is taken.
+    /// Leaves out the pictures from that time on, where the one before ends, too. Only before the first is
+    /// taken.
     void EndAt(double seconds);
 
     /// Makes the pictures end now. Any thread.
@@ -90,6 +92,7 @@ private:
     PictureConverter converter_;
     SubtitleBurner* const burner_;
     StampRepair stamps_;
+    LastStay lastStay_;
     av::Frame held_; // decoded, its stamp not settled yet
     std::optional<int64_t> begin_;
     std::optional<int64_t> end_;

@@ -52,6 +52,8 @@ bool PictureStamps::Advance() {
     while (std::optional<StampRepair::Stamp> stamp = NextSettled()) {
         if (end_ && stamp->time >= *end_)
             return false;
+        if (end_)
+            stamp->duration = std::min(stamp->duration, *end_ - stamp->time);
         if (begin_ && stamp->time + stamp->duration <= *begin_)
             continue;
         if (const int64_t begin = begin_.value_or(0); first_ && (begin_ || stamp->time > begin)) {
@@ -77,7 +79,8 @@ std::optional<StampRepair::Stamp> PictureStamps::NextSettled() {
         const std::optional<int64_t> shown = NextShown();
         settledAll_ = !shown;
         const int before = repair_.Repaired();
-        if (const auto settled = shown ? repair_.Push(shown) : repair_.Finish()) {
+        if (const auto settled =
+                shown ? repair_.Push(shown) : repair_.Finish(lastStay_.Told(reader_, timeBase_))) {
             repaired_ = repair_.Repaired() != before;
             return settled;
         }
@@ -90,6 +93,8 @@ std::optional<int64_t> PictureStamps::NextShown() {
     while (!readAll_ && decoded_.size() <= kMostReordered) {
         const av::Packet packet = demuxer_.Take(stream_);
         readAll_ = !packet;
+        if (packet)
+            lastStay_.Add(*packet);
         if (packet && IsShown(*packet))
             decoded_.push(reader_.MediaTime(packet->pts, timeBase_));
     }

@@ -4,6 +4,7 @@
 #define MOVIECONV_HOST_SOURCE_PICTURESTAMPS_H
 
 #include "host/source/Demuxer.h"
+#include "host/source/LastStay.h"
 #include "host/source/Source.h"
 #include "host/source/StampRepair.h"
 #include "media/Decoders.h"
@@ -27,7 +28,8 @@ public:
     VideoImage* GetCurrentImage() override;
     int DecodeNext(int mode) override;
 
-    /// Leaves out the pictures from that time on. Only before the first is taken.
+    /// Leaves out the pictures from that time on, where the one before ends, too. Only before the first is
+    /// taken.
     void EndAt(double seconds);
 
     /// Whether the source's last picture was handed out. Any thread.
@@ -52,6 +54,7 @@ private:
     const AVCodecID codec_;
     VideoSourceInfo info_{};
     StampRepair repair_;
+    LastStay lastStay_;
     std::priority_queue<int64_t, std::vector<int64_t>, std::greater<>> decoded_; // of packets, in media time
     std::optional<int64_t> firstKey_; // when the first picture that can be decoded is shown
     std::optional<int64_t> begin_;

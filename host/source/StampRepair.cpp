@@ -12,10 +12,12 @@ std::optional<StampRepair::Stamp> StampRepair::Push(std::optional<int64_t> stamp
     return settled;
 }
 
-std::optional<StampRepair::Stamp> StampRepair::Finish() {
+std::optional<StampRepair::Stamp> StampRepair::Finish(std::optional<Stamp> told) {
     if (!held_)
         return std::nullopt;
-    const Stamp settled = Settle(std::nullopt);
+    Stamp settled = Settle(std::nullopt);
+    if (told && held_->stamp == told->time)
+        settled.duration = told->duration;
     held_.reset();
     return settled;
 }

@@ -14,7 +14,8 @@ class StampRepair {
 public:
     struct Stamp {
         int64_t time = 0;
-        int64_t duration = 0; ///< To the next picture's stamp.
+        int64_t duration =
+            0; ///< To the next picture's stamp; the last one's as it is told, else the usual distance.
     };
 
     /// `step` is the usual distance between pictures.
@@ -24,8 +25,9 @@ public:
     /// nothing for the first.
     std::optional<Stamp> Push(std::optional<int64_t> stamp);
 
-    /// The stamp of the last picture; nothing when there was none.
-    std::optional<Stamp> Finish();
+    /// The stamp of the last picture; nothing when there was none. `told`: what the source tells of the
+    /// picture that it shows last, which counts if that is this one.
+    std::optional<Stamp> Finish(std::optional<Stamp> told = std::nullopt);
 
     /// Stamps that were changed.
     int Repaired() const { return repaired_; }

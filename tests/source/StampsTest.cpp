@@ -54,6 +54,15 @@ TEST(StampRepair, GivesTheDistanceToTheNextPictureAsDuration) {
     EXPECT_EQ(repair.Finish()->duration, kStep);
 }
 
+TEST(StampRepair, TakesTheLastDurationAsItIsToldOfThatPicture) {
+    for (const int64_t stamp : {123, 124}) {
+        StampRepair repair(kStep);
+        repair.Push(0);
+        repair.Push(123);
+        EXPECT_EQ(repair.Finish(StampRepair::Stamp{stamp, 77})->duration, stamp == 123 ? 77 : kStep);
+    }
+}
+
 constexpr int kRate = 1000; // samples a second: a sample is a millisecond
 
 int64_t Ms(int64_t milliseconds) {

@@ -5,6 +5,7 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cmath>
 #include <string>
 #include <utility>
@@ -104,6 +105,46 @@ TEST(Times, OfStreamsThatBeginLateOrPause) {
                 EXPECT_NEAR(times[count - last], 20 - static_cast<double>(last), 0.1);
         }
     }
+}
+
+double EndOf(const Seen& seen) {
+    return seen.pictures.empty() ? 0 : seen.pictures.back().time + seen.pictures.back().duration;
+}
+
+TEST(Times, OfTheLastPictureLastAsLongAsItsSourceTells) {
+    const Args picks{"-fps_mode", "passthrough", "-vf"};
+    const std::string held =
+        Make("held.gif", Join(CountedPictures(1, "10"), Args{"-final_delay", "300"})); // of 100 a second
+    const std::string slides =
+        Make("slides.mkv", Join(Join(CountedPictures(4.24), NearLossless()),
+                                Join(picks, Args{"select='not(n)+eq(n,25)+eq(n,100)+eq(n,105)'"})));
+    const struct {
+        std::string source;
+        Args options;
+        double end;
+    } cases[] = {
+        {held, {}, 3.9},
+        {held, {"--frame-rate", "25"}, 3.9},
+        {held, {"--begin", "0.5", "--length", "2"}, 2},
+        {held, {"--begin", "2"}, 1.9},
+        {held, {"--jobs", "2", "--pieces", "2"}, 3.9},
+        {slides, {}, 4.24},
+        {slides, {"--length", "3"}, 3},
+        {slides, {"--jobs", "2", "--pieces", "2"}, 4.24},
+    };
+    for (const auto& test : cases) {
+        for (const char* format : {"mp4", "mkv", "avi", "gif"}) {
+            const bool inPieces =
+                std::find(test.options.begin(), test.options.end(), "--jobs") != test.options.end();
+            if (inPieces && format == std::string("gif"))
+                continue; // which is not made of any
+            SCOPED_TRACE(test.source + " " + format + " " + std::to_string(&test - cases));
+            EXPECT_NEAR(EndOf(Convert(test.source, test.options, format)), test.end, 0.11);
+        }
+    }
+    const Folder folder;
+    ASSERT_EQ(Call({"-q", "--split", "1", slides, folder / "clip.mp4"}).code, 0);
+    EXPECT_NEAR(EndOf(inspect::LookAt(folder / "clip_01.mp4")), 3, 0.05);
 }
 
 // MPEG-2 has few rates; one that nobody asked for is brought to the next one.

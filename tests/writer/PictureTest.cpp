@@ -122,6 +122,37 @@ TEST(Pictures, StampsOfAVariableRateAreKept) {
         EXPECT_NEAR(read.pictures[i].time, static_cast<double>(times[i]) / 1e7, 0.0002);
 }
 
+TEST(Pictures, TheLastOneStaysAsLongAsItTells) {
+    constexpr int64_t kMs = kTicksPerSecond / 1000;
+    struct {
+        uint32_t codec, format;
+    } const cases[] = {{FourCC("H264"), FourCC("MP4 ")},
+                       {FourCC("MJPG"), FourCC("MP4 ")},
+                       {FourCC("H264"), FourCC("MKV ")},
+                       {FourCC("MJPG"), FourCC("MKV ")},
+                       {FourCC("GIF "), FourCC("GIF ")}};
+    for (const auto& [codec, format] : cases) {
+        for (const int64_t stay : {20 * kMs, 40 * kMs, 700 * kMs, 5000 * kMs}) {
+            SCOPED_TRACE(std::to_string(codec) + " " + std::to_string(format) + " " + std::to_string(stay));
+            TestMovie movie = WithoutSound();
+            movie.param.fccVideo = codec;
+            movie.param.fccFileFormat = format;
+            const ReadMovie read = WriteAndRead(movie, [stay = stay](void* file) {
+                TestPicture picture(160, 120);
+                for (int number = 0; number < 10; ++number) {
+                    VideoImage image = picture.Paint(number, number * 80 * kMs);
+                    image.nDuration = static_cast<int32_t>(number < 9 ? 80 * kMs : stay);
+                    EXPECT_EQ(MWWriteVideoFrame(file, &image), 1);
+                }
+            });
+            EXPECT_NEAR(read.duration, 0.72 + static_cast<double>(stay) / kTicksPerSecond, 0.005);
+            const WriterStatus status = Latest();
+            EXPECT_EQ(status.llPicturesReceived + status.llPicturesRepeated, status.llPicturesWritten);
+            EXPECT_EQ(static_cast<int64_t>(read.pictures.size()), status.llPicturesWritten);
+        }
+    }
+}
+
 TEST(Pictures, LastThroughALongPause) {
     struct {
         uint32_t codec, format;
