@@ -173,12 +173,14 @@ void BesidePackets::Hold(av::Packet packet) {
     latest_ = std::max(latest_, held.begin);
     if (held.Ends() && held.end <= fileBegin_)
         return;
-    const bool isKnown = std::any_of(pending_.begin(), pending_.end(), [&](const Held& other) {
-        return other.begin == held.begin && other.end == held.end &&
-               other.packet->size == held.packet->size &&
-               std::equal(held.packet->data, held.packet->data + held.packet->size, other.packet->data);
-    });
-    if (isKnown && held.begin < bounds_.begin)
+    const bool mayBeKnown = held.begin < bounds_.begin; // it was read with the earlier cues, and here again
+    const bool isKnown =
+        mayBeKnown && std::any_of(pending_.begin(), pending_.end(), [&](const Held& other) {
+            return other.begin == held.begin && other.end == held.end &&
+                   other.packet->size == held.packet->size &&
+                   std::equal(held.packet->data, held.packet->data + held.packet->size, other.packet->data);
+        });
+    if (isKnown)
         return;
     const auto later = std::upper_bound(pending_.begin(), pending_.end(), held.begin,
                                         [](int64_t time, const Held& other) { return time < other.begin; });
