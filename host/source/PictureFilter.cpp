@@ -3,6 +3,11 @@
 #include "ffmpeg/FilterLibrary.h"
 #include "host/source/SourceError.h"
 
+extern "C" {
+#include <libavutil/pixdesc.h>
+}
+
+#include <fmt/format.h>
 #include <string>
 
 namespace movieconv {
@@ -12,13 +17,19 @@ namespace {
 constexpr char kToneMap[] = "zscale=t=linear:npl=100,format=gbrpf32le,zscale=p=bt709,tonemap=hable:desat=0,"
                             "zscale=t=bt709:m=bt709:r=tv,format=";
 
-/// Does `work` with the filters, whose errors are the source's.
+/// Does `work` with the filters, whose errors are the source's. `matrix` is that of HDR to be brought to SDR;
+/// null: there is none.
 template <class Work>
-void Filtering(Work work) {
+void Filtering(Work work, const char* matrix) {
     try {
         work();
     } catch (const av::FilterError& error) {
-        throw SourceError(std::string("its pictures cannot be filtered: ") + error.what());
+        throw SourceError(
+            matrix == nullptr
+                ? fmt::format("its pictures cannot be filtered: {}", error.what())
+                : fmt::format("its HDR pictures with the colour matrix \"{}\" cannot be brought to "
+                              "BT.709: {}",
+                              matrix, error.what()));
     }
 }
 
@@ -28,7 +39,8 @@ void CompleteColours(AVFrame& picture, int transfer) {
         picture.color_trc = static_cast<AVColorTransferCharacteristic>(transfer);
     if (picture.color_primaries == AVCOL_PRI_UNSPECIFIED)
         picture.color_primaries = AVCOL_PRI_BT2020;
-    if (picture.colorspace == AVCOL_SPC_UNSPECIFIED)
+    // The filters do not know constant luminance, which has the same coefficients.
+    if (picture.colorspace == AVCOL_SPC_UNSPECIFIED || picture.colorspace == AVCOL_SPC_BT2020_CL)
         picture.colorspace = AVCOL_SPC_BT2020_NCL;
     if (picture.color_range == AVCOL_RANGE_UNSPECIFIED)
         picture.color_range = AVCOL_RANGE_MPEG;
@@ -50,22 +62,26 @@ bool PictureFilter::Push(AVFrame& picture, std::optional<int64_t> stamp, const S
         return sink(picture, stamp);
     if (graph_ && !graph_->Fits(picture) && !Finish(sink))
         return false;
-    Filtering([&] {
-        if (!graph_)
-            graph_.emplace(picture, Chain());
-        if (transfer_ != 0)
-            CompleteColours(picture, transfer_);
-        picture.pts = count_++;
-        stamps_.push_back(stamp);
-        graph_->Push(picture);
-    });
+    Filtering(
+        [&] {
+            if (!graph_)
+                graph_.emplace(picture, Chain());
+            if (transfer_ != 0) {
+                CompleteColours(picture, transfer_);
+                matrix_ = av_color_space_name(picture.colorspace);
+            }
+            picture.pts = count_++;
+            stamps_.push_back(stamp);
+            graph_->Push(picture);
+        },
+        matrix_);
     return HandOut(sink);
 }
 
 bool PictureFilter::Finish(const Sink& sink) {
     if (!graph_)
         return true;
-    Filtering([&] { graph_->Finish(); });
+    Filtering([&] { graph_->Finish(); }, matrix_);
     const bool goesOn = HandOut(sink);
     graph_.reset();
     stamps_.clear();
@@ -84,7 +100,7 @@ std::string PictureFilter::Chain() const {
 bool PictureFilter::HandOut(const Sink& sink) {
     for (;;) {
         av::Frame picture;
-        Filtering([&] { picture = graph_->Take(); });
+        Filtering([&] { picture = graph_->Take(); }, matrix_);
         if (!picture)
             return true;
         std::optional<int64_t> stamp;

@@ -43,7 +43,8 @@ private:
 
     const Deinterlace deinterlace_;
     const bool deep_;
-    const int transfer_; // of HDR that becomes SDR; 0: none does
+    const int transfer_;           // of HDR that becomes SDR; 0: none does
+    const char* matrix_ = nullptr; // of its latest picture
     bool deinterlaced_ = false;
     bool leftInterlaced_ = false;
     std::optional<av::FilterGraph> graph_;

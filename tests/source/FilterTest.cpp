@@ -106,6 +106,22 @@ TEST(Filters, BringHdrToTheLightOfUsualDisplays) {
     }
 }
 
+TEST(Filters, BringHdrOfOtherMatricesOrNameThem) {
+    const std::string path = Make(
+        "grey-hdr.mkv", {"-f", "lavfi", "-i", "color=gray:s=64x64:d=0.2,format=yuv420p10le", "-c:v",
+                         "libx265", "-x265-params", "log-level=none:colorprim=9:colormatrix=9:transfer=16"});
+    const auto convert = [&](const std::string& matrix) {
+        Movie movie(Make("grey-hdr-" + matrix + ".mkv",
+                         {"-i", path, "-c", "copy", "-bsf:v", "hevc_metadata=matrix_coefficients=" + matrix}),
+                    {});
+        const VideoImage* image = movie.Pictures()->GetCurrentImage();
+        return image != nullptr ? std::to_string(image->pY[0]) : movie.ReadError();
+    };
+    EXPECT_EQ(convert("10"), convert("9")); // the same but for the constant luminance
+    const std::string error = convert("11");
+    EXPECT_NE(error.find("smpte2085"), std::string::npos) << error;
+}
+
 /// A movie whose second half only shows all of the picture between the borders.
 std::string Letterboxed() {
     const std::string pictures =

@@ -98,6 +98,8 @@ constexpr const char* kSentences[] = {
     QT_TRANSLATE_NOOP("Library", "“%1” has changed meanwhile"),
     QT_TRANSLATE_NOOP("Library", "its borders cannot be looked for: %1"),
     QT_TRANSLATE_NOOP("Library", "its pictures cannot be filtered: %1"),
+    QT_TRANSLATE_NOOP("Library",
+                      "its HDR pictures with the colour matrix “%1” cannot be brought to BT.709: %2"),
     QT_TRANSLATE_NOOP("Library", "reading “%1” failed after %2: %3; what was read is converted"),
     QT_TRANSLATE_NOOP("Library", "reading “%1” failed after %2: %3"),
     QT_TRANSLATE_NOOP("Library", "the file was cut meanwhile"),

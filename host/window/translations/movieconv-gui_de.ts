@@ -730,6 +730,10 @@
         <translation>die Bilder lassen sich nicht filtern: %1</translation>
     </message>
     <message>
+        <source>its HDR pictures with the colour matrix “%1” cannot be brought to BT.709: %2</source>
+        <translation>die HDR-Bilder mit der Farbmatrix „%1“ lassen sich nicht auf BT.709 bringen: %2</translation>
+    </message>
+    <message>
         <source>the file was cut meanwhile</source>
         <translation>die Datei wurde inzwischen gekürzt</translation>
     </message>
