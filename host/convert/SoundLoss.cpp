@@ -36,6 +36,8 @@ void TellLossOf(const SoundStreamInfo& sound, const SoundPlan& plan, EncodeParam
     if (MWPlanSound(&param, &format, &written) == 0)
         return;
     const uint64_t asked = av::SpeakersFor(channels, sound.speakers);
+    if (asked == 0 && written.nChannels < channels)
+        texts.push_back(fmt::format("its sound of {} channels got {}", channels, written.nChannels));
     if ((av::AlikeSpeakers(asked) & ~av::AlikeSpeakers(written.nChannelMask)) != 0)
         texts.push_back(
             fmt::format("its {} sound became {}", LayoutName(asked), LayoutName(written.nChannelMask)));

@@ -111,6 +111,8 @@ TEST(UnusualPictures, WhatTheOutputCannotHoldIsTold) {
         Make("12-bits.mkv", Join(CountedPictures(0.2), Words("-c:v ffv1 -pix_fmt yuv420p12")));
     const std::string fields = Make("fields.mkv", Join(CountedPictures(0.2), interlaced));
     const std::string wide = Make("wide-sound.mka", tones);
+    const std::string twelve =
+        Make("twelve-channels.wav", Words("-f s16le -ac 12 -ar 48000 -t 0.5 -i /dev/zero -c:a pcm_s16le"));
     const struct {
         std::string source;
         Args options;
@@ -126,6 +128,8 @@ TEST(UnusualPictures, WhatTheOutputCannotHoldIsTold) {
         {wide, {}, "o.mp3", "its 7.1 sound became stereo, its sound of 192000 Hz got 48000"},
         {wide, {"--channels", "2", "--sample-rate", "48000"}, "o.mp3", ""},
         {wide, {"--audio-codec", "PCM"}, "o.wav", ""},
+        {twelve, {}, "o.wav", "its sound of 12 channels got 8"},
+        {twelve, {"--channels", "2"}, "o.wav", ""},
     };
     for (const auto& test : cases) {
         SCOPED_TRACE(testing::Message() << test.output << ' ' << test.told);

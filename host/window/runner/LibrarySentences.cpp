@@ -177,6 +177,7 @@ constexpr const char* kSentences[] = {
     QT_TRANSLATE_NOOP("Library", "its pictures of %1 bits got 10"),
     QT_TRANSLATE_NOOP("Library", "its %1 sound became %2"),
     QT_TRANSLATE_NOOP("Library", "its sound of %1 Hz got %2"),
+    QT_TRANSLATE_NOOP("Library", "its sound of %1 channels got %2"),
     QT_TRANSLATE_NOOP("Library", "its %1 pictures keep their colours at half the resolution (4:2:0)"),
     QT_TRANSLATE_NOOP("Library", "the transparency of its pictures was left out"),
     QT_TRANSLATE_NOOP("Library", "the source's clock jumped once; the parts were joined"),

@@ -950,6 +950,10 @@
         <translation>der Ton mit %1 Hz bekam %2</translation>
     </message>
     <message>
+        <source>its sound of %1 channels got %2</source>
+        <translation>der Ton mit %1 Kanälen bekam %2</translation>
+    </message>
+    <message>
         <source>its %1 pictures keep their colours at half the resolution (4:2:0)</source>
         <translation>die Bilder in %1 behalten ihre Farben in halber Auflösung (4:2:0)</translation>
     </message>
