@@ -293,7 +293,8 @@ TEST(Burn, RefusesWhatIsNotThere) {
     const Result made = program::Run({"env", nowhere, MOVIECONV_PROGRAM, whole_movie::Make(true),
                                       folder / "out.mp4", "--burn-subtitles", "4"});
     EXPECT_EQ(made.code, 4);
-    EXPECT_EQ(made.err, "movieconv: error: cannot make a folder for the subtitles: No such file or directory\n");
+    EXPECT_EQ(made.err,
+              "movieconv: error: cannot make a folder for the subtitles: No such file or directory\n");
     EXPECT_TRUE(folder.Names().empty());
 }
 
