@@ -1,6 +1,5 @@
 #include "host/source/CueDrawer.h"
 #include "host/source/MediaTime.h"
-#include "host/source/SourceError.h"
 
 #include <algorithm>
 #include <cmath>
@@ -50,16 +49,7 @@ public:
     BitmapDrawer(CueList list, PictureStreamInfo pictures)
         : list_(std::move(list)),
           pictures_(std::move(pictures)),
-          decoder_(avcodec_alloc_context3(avcodec_find_decoder(list_.parameters->codec_id))) {
-        if (!decoder_)
-            throw std::bad_alloc();
-        av::CheckMemory(avcodec_parameters_to_context(decoder_.get(), list_.parameters.get()));
-        decoder_->pkt_timebase = {1, kTicksPerSecond};
-        const int result = avcodec_open2(decoder_.get(), decoder_->codec, nullptr);
-        av::CheckMemory(result);
-        if (result < 0)
-            throw TrackError("the subtitles cannot be decoded: " + av::ErrorText(result));
-    }
+          decoder_(list_.OpenDecoder({1, kTicksPerSecond})) {}
 
     bool Changes(int64_t time) override {
         for (; next_ < list_.cues.size() && list_.cues[next_].begin <= time; ++next_)

@@ -9,6 +9,7 @@
 #include <algorithm>
 #include <fmt/format.h>
 #include <memory>
+#include <new>
 #include <utility>
 
 namespace movieconv {
@@ -91,6 +92,19 @@ void ReadFile(CueList& list, const Source& source, const BurnWish& wish) {
 bool NamesStream(const BurnWish& wish) {
     return !wish.what.empty() && std::all_of(wish.what.begin(), wish.what.end(),
                                              [](char letter) { return letter >= '0' && letter <= '9'; });
+}
+
+av::CodecContext CueList::OpenDecoder(AVRational timeBase) const {
+    av::CodecContext decoder(avcodec_alloc_context3(avcodec_find_decoder(parameters->codec_id)));
+    if (!decoder)
+        throw std::bad_alloc();
+    av::CheckMemory(avcodec_parameters_to_context(decoder.get(), parameters.get()));
+    decoder->pkt_timebase = timeBase;
+    const int result = avcodec_open2(decoder.get(), decoder->codec, nullptr);
+    av::CheckMemory(result);
+    if (result < 0)
+        throw TrackError("the subtitles cannot be decoded: " + av::ErrorText(result));
+    return decoder;
 }
 
 bool CueList::IsText() const {

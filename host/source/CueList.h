@@ -22,6 +22,9 @@ struct CueList {
     std::vector<Cue> cues; ///< By their begins.
 
     bool IsText() const;
+
+    /// A decoder for packets whose stamps count in `timeBase`. Throws TrackError.
+    av::CodecContext OpenDecoder(AVRational timeBase) const;
 };
 
 /// Throws TrackError when there are no such subtitles, or they cannot be read or decoded.

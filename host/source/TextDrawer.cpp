@@ -101,16 +101,7 @@ bool Moves(const std::string& line) {
 /// The events of a list as one script has them, in the order of their begins.
 class Script {
 public:
-    explicit Script(const CueList& list)
-        : decoder_(avcodec_alloc_context3(avcodec_find_decoder(list.parameters->codec_id))) {
-        if (!decoder_)
-            throw std::bad_alloc();
-        av::CheckMemory(avcodec_parameters_to_context(decoder_.get(), list.parameters.get()));
-        decoder_->pkt_timebase = {1, 1000};
-        const int result = avcodec_open2(decoder_.get(), decoder_->codec, nullptr);
-        av::CheckMemory(result);
-        if (result < 0)
-            throw TrackError("the subtitles cannot be decoded: " + av::ErrorText(result));
+    explicit Script(const CueList& list) : decoder_(list.OpenDecoder({1, 1000})) {
         for (const CueList::Cue& cue : list.cues)
             Decode(cue);
         std::stable_sort(events_.begin(), events_.end(),
