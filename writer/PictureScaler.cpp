@@ -36,14 +36,27 @@ int Proportional(double value, int limit) {
     return std::clamp(static_cast<int>(std::lround(value)), 1, limit);
 }
 
-void PaintBlack(AVFrame& frame, const PictureFit& fit, bool fullRange) {
-    if (fit.fittedWidth == fit.width && fit.fittedHeight == fit.height)
-        return;
+void PaintBlack(AVFrame& frame, bool fullRange) {
     ptrdiff_t linesize[4];
     std::copy_n(frame.linesize, 4, linesize);
     const AVColorRange range = fullRange ? AVCOL_RANGE_JPEG : AVCOL_RANGE_MPEG;
     av_image_fill_black(frame.data, linesize, static_cast<AVPixelFormat>(frame.format), range, frame.width,
                         frame.height);
+}
+
+/// The picture becomes the rectangle of `fit`.
+void PutInto(AVFrame& frame, const AVFrame& picture, const PictureFit& fit) {
+    const auto format = static_cast<AVPixelFormat>(frame.format);
+    const int chromaShift = av_pix_fmt_desc_get(format)->log2_chroma_h;
+    for (int plane = 0; plane < av_pix_fmt_count_planes(format); ++plane) {
+        const int shift = plane == 0 ? 0 : chromaShift;
+        uint8_t* corner = frame.data[plane] +
+                          static_cast<ptrdiff_t>(fit.top >> shift) * frame.linesize[plane] +
+                          av_image_get_linesize(format, fit.left, plane);
+        av_image_copy_plane(corner, frame.linesize[plane], picture.data[plane], picture.linesize[plane],
+                            av_image_get_linesize(format, picture.width, plane),
+                            AV_CEIL_RSHIFT(picture.height, shift));
+    }
 }
 
 /// Repeats the last column and row of a picture that is `padWidth` and `padHeight` smaller than its frame.
@@ -130,21 +143,23 @@ av::Frame PictureScaler::Convert(av::Frame picture) {
     av::Frame frame =
         pool_.Get(output_.format, output_.width + output_.padWidth, output_.height + output_.padHeight);
     av_frame_copy_props(frame.get(), picture.get());
-    PaintBlack(*frame, fit_, output_.fullRange);
-    const bool deep = output_.format == AV_PIX_FMT_YUV420P10;
-    const bool packed = frame->data[1] == nullptr;
-    const int sampleBytes = packed ? 4 : deep ? 2 : 1;
-    uint8_t* planes[4] = {frame->data[0] + static_cast<ptrdiff_t>(fit_.top) * frame->linesize[0] +
-                          fit_.left * sampleBytes};
-    for (int plane = 1; plane < 3 && !packed; ++plane)
-        planes[plane] = frame->data[plane] + static_cast<ptrdiff_t>(fit_.top / 2) * frame->linesize[plane] +
-                        fit_.left / 2 * sampleBytes;
-    if (sws_scale(scaler_.get(), picture->data, picture->linesize, 0, picture->height, planes,
-                  frame->linesize) < 0)
-        throw std::bad_alloc();
-    const auto repeat = deep ? RepeatEdges<uint16_t> : RepeatEdges<uint8_t>;
+    if (fit_.fittedWidth == fit_.width && fit_.fittedHeight == fit_.height) {
+        Scale(*picture, *frame);
+    } else { // not straight into the frame: the scaler also writes behind its rows
+        const av::Frame fitted = fittedPool_.Get(output_.format, fit_.fittedWidth, fit_.fittedHeight);
+        Scale(*picture, *fitted);
+        PaintBlack(*frame, output_.fullRange);
+        PutInto(*frame, *fitted, fit_);
+    }
+    const auto repeat = output_.format == AV_PIX_FMT_YUV420P10 ? RepeatEdges<uint16_t> : RepeatEdges<uint8_t>;
     repeat(*frame, output_.padWidth, output_.padHeight);
     return frame;
+}
+
+void PictureScaler::Scale(const AVFrame& picture, AVFrame& scaled) {
+    if (sws_scale(scaler_.get(), picture.data, picture.linesize, 0, picture.height, scaled.data,
+                  scaled.linesize) < 0)
+        throw std::bad_alloc();
 }
 
 void PictureScaler::PrepareFor(const AVFrame& picture) {

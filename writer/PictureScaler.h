@@ -69,6 +69,7 @@ public:
 
 private:
     void PrepareFor(const AVFrame& picture);
+    void Scale(const AVFrame& picture, AVFrame& scaled);
 
     const Output output_;
     const AVRational sampleAspect_;
@@ -80,6 +81,7 @@ private:
     int sourceFormat_ = AV_PIX_FMT_NONE;
     av::Scaler scaler_;
     FramePool pool_;
+    FramePool fittedPool_; ///< Of pictures that get borders.
 };
 
 } // namespace writer

@@ -80,6 +80,22 @@ TEST(Pictures, AnotherOutputSizeIsBorderedOrStretchedAndTheShapeOfPixelsIsCarrie
     EXPECT_EQ(av_cmp_q(stretched.sampleAspect, {8, 11}), 0);
 }
 
+TEST(Pictures, BordersAreBlackUpToThePicture) {
+    TestMovie movie = WithoutSound();
+    movie.param.fccFileFormat = FourCC("MKV ");
+    movie.param.fccVideo = FourCC("FFV1");
+    movie.param.nWidth = 320;
+    movie.param.nHeight = 100; // the picture becomes 133 wide, from 92 on
+    const ReadMovie read = WriteAndRead(movie);
+    ASSERT_FALSE(read.pictures.empty());
+    EXPECT_GT(read.pictures[0].At(160, 50), 30);
+    for (int x = 0; x < 320; ++x) {
+        if (x < 92 || x > 225) {
+            EXPECT_EQ(read.pictures[0].At(x, 50), 16) << x;
+        }
+    }
+}
+
 TEST(Pictures, ASizeThatChangesOnTheWayIsScaled) {
     const ReadMovie read = WriteAndRead(WithoutSound(), [](void* file) {
         int number = 0;
