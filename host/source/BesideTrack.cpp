@@ -1,5 +1,7 @@
 #include "host/source/BesideTrack.h"
 
+#include "host/source/PacketTime.h"
+
 #include <algorithm>
 #include <iterator>
 #include <utility>
@@ -163,7 +165,7 @@ void BesidePackets::KeepDivided() {
 
 void BesidePackets::Hold(av::Packet packet) {
     Held held{std::move(packet), latest_, latest_};
-    const int64_t stamp = held.packet->pts != AV_NOPTS_VALUE ? held.packet->pts : held.packet->dts;
+    const int64_t stamp = StampOf(*held.packet);
     if (stamp != AV_NOPTS_VALUE) {
         held.begin = clock_(stamp, timeBase_);
         const bool isLasting = av_rescale_q(held.packet->duration, timeBase_, {1, 1}) >= kLongest;

@@ -1,6 +1,7 @@
 #include "host/source/CueList.h"
 
 #include "host/source/MediaTime.h"
+#include "host/source/PacketTime.h"
 #include "host/source/SourceError.h"
 #include "host/source/StreamChoice.h"
 #include "host/source/StreamDecoder.h"
@@ -50,7 +51,7 @@ void ReadStream(CueList& list, const Source& source, const BurnWish& wish, bool 
         av::Packet packet = av::NewPacket();
         const int result = av_read_frame(context, packet.get());
         av::CheckMemory(result);
-        const int64_t stamp = packet->pts != AV_NOPTS_VALUE ? packet->pts : packet->dts;
+        const int64_t stamp = StampOf(*packet);
         if (result < 0)
             return;
         if (packet->stream_index != stream || stamp == AV_NOPTS_VALUE)

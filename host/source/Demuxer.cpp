@@ -1,6 +1,7 @@
 #include "host/source/Demuxer.h"
 
 #include "host/source/MediaTime.h"
+#include "host/source/PacketTime.h"
 
 #include <algorithm>
 #include <limits>
@@ -122,7 +123,7 @@ bool Demuxer::KeyPictureAtOrBefore(int64_t mediaTime) {
     const av::Packet packet = av::NewPacket();
     for (int i = 0; i < kProbedPackets && av_read_frame(source_.Reader().Context(), packet.get()) >= 0; ++i) {
         const bool isKey = packet->stream_index == pictures->index && (packet->flags & AV_PKT_FLAG_KEY) != 0;
-        const int64_t stamp = packet->pts != AV_NOPTS_VALUE ? packet->pts : packet->dts;
+        const int64_t stamp = StampOf(*packet);
         av_packet_unref(packet.get());
         if (isKey)
             return stamp == AV_NOPTS_VALUE ||
@@ -351,10 +352,9 @@ void Demuxer::Enqueue(Queue& queue, av::Packet packet, std::optional<int64_t> en
 }
 
 std::optional<int64_t> Demuxer::EndOf(const AVPacket& packet) const {
-    const int64_t stamp = packet.pts != AV_NOPTS_VALUE ? packet.pts : packet.dts;
-    if (stamp == AV_NOPTS_VALUE)
+    if (StampOf(packet) == AV_NOPTS_VALUE)
         return std::nullopt;
-    return source_.Reader().MediaTime(stamp + packet.duration,
+    return source_.Reader().MediaTime(EndStampOf(packet),
                                       source_.Reader().Context()->streams[packet.stream_index]->time_base);
 }
 

@@ -1,6 +1,7 @@
 #include "host/source/EarlierCues.h"
 
 #include "host/source/MediaTime.h"
+#include "host/source/PacketTime.h"
 
 #include <algorithm>
 #include <utility>
@@ -26,7 +27,7 @@ std::map<int, std::vector<av::Packet>> ReadEarlierCues(MovieReader& file, int ma
         av::CheckMemory(result);
         if (result < 0)
             return found;
-        const int64_t stamp = packet->pts != AV_NOPTS_VALUE ? packet->pts : packet->dts;
+        const int64_t stamp = StampOf(*packet);
         if (stamp == AV_NOPTS_VALUE)
             continue;
         const bool isEarlier =

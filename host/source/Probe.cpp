@@ -1,6 +1,7 @@
 #include "host/source/Probe.h"
 
 #include "host/source/MediaTime.h"
+#include "host/source/PacketTime.h"
 #include "host/source/SourceError.h"
 #include "host/source/StreamDecoder.h"
 #include "host/source/StreamDescription.h"
@@ -93,12 +94,12 @@ Stretch ReadStretch(MovieReader& reader, int counted, int64_t mostBytes,
             ++stretch.packets;
             stretch.length += static_cast<double>(packet->duration) * av_q2d(stream->time_base);
         }
-        const int64_t stamp = packet->pts != AV_NOPTS_VALUE ? packet->pts : packet->dts;
+        const int64_t stamp = StampOf(*packet);
         if (stamp != AV_NOPTS_VALUE) {
             stretch.first = std::min(stretch.first, ToSeconds(reader.MediaTime(stamp, stream->time_base)));
             stretch.last = std::max(stretch.last, ToSeconds(reader.MediaTime(stamp, stream->time_base)));
-            stretch.end = std::max(stretch.end,
-                                   ToSeconds(reader.MediaTime(stamp + packet->duration, stream->time_base)));
+            stretch.end =
+                std::max(stretch.end, ToSeconds(reader.MediaTime(EndStampOf(*packet), stream->time_base)));
         }
         av_packet_unref(packet.get());
     }

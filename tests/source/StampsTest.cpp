@@ -1,4 +1,5 @@
 #include "host/source/MediaTime.h"
+#include "host/source/PacketTime.h"
 #include "host/source/SoundTimeline.h"
 #include "host/source/StampRepair.h"
 
@@ -44,6 +45,24 @@ TEST(StampRepair, KeepsRisingStampsAndMendsTheOthers) {
             times.push_back(last->time);
         EXPECT_EQ(times, test.times) << &test - cases;
         EXPECT_EQ(repair.Repaired(), test.repairs) << &test - cases;
+    }
+}
+
+TEST(PacketTime, StaysWithinWhatStampsCanTell) {
+    const struct {
+        int64_t pts, dts, duration, stamp, end;
+    } cases[] = {
+        {10, 5, 3, 10, 13},
+        {AV_NOPTS_VALUE, 5, 3, 5, 8},
+        {INT64_MAX - 1, 5, 3, INT64_MAX - 1, INT64_MAX},
+    };
+    for (const auto& test : cases) {
+        AVPacket packet{};
+        packet.pts = test.pts;
+        packet.dts = test.dts;
+        packet.duration = test.duration;
+        EXPECT_EQ(movieconv::StampOf(packet), test.stamp);
+        EXPECT_EQ(movieconv::EndStampOf(packet), test.end);
     }
 }
 
