@@ -68,8 +68,8 @@ void ChooseLayout(const AVCodec& codec, const SoundSettings& settings, int most,
     const bool isSources = std::popcount(settings.speakers) == settings.channels;
     const int channels = isSources ? most : std::min(settings.channels, most);
     uint64_t wanted = av::SpeakersFor(settings.channels, settings.speakers);
-    if (wanted == 0)
-        wanted = av::UsualSpeakers(channels);
+    if (wanted == 0) // of which the first two channels are used
+        wanted = channels > 1 ? AV_CH_LAYOUT_STEREO : AV_CH_LAYOUT_MONO;
     const auto worth = [wanted](uint64_t one) {
         const int count = std::popcount(one);
         return std::tuple(Kept(one, wanted), one == wanted, -count, one == av::UsualSpeakers(count));
