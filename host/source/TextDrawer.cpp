@@ -33,27 +33,38 @@ struct Event {
 /// A script and its fonts in a folder that lasts until the script has been read.
 class ScriptFolder {
 public:
-    ScriptFolder(const std::string& script, const std::vector<FontFile>& fonts) {
-        std::error_code error;
-        path_ = (std::filesystem::temp_directory_path(error) / "movieconv-XXXXXX").string();
-        if (!error && mkdtemp(path_.data()) == nullptr)
-            error = {errno, std::generic_category()};
-        if (error)
-            throw ScratchError(fmt::format("cannot make a folder for the subtitles: {}", error.message()));
-        Write("script.ass", script.data(), script.size());
-        for (std::size_t i = 0; i < fonts.size(); ++i)
-            Write(std::to_string(i), fonts[i].data(), fonts[i].size());
+    ScriptFolder(const std::string& script, const std::vector<FontFile>& fonts) : path_(NewFolder()) {
+        try {
+            Write("script.ass", script.data(), script.size());
+            for (std::size_t i = 0; i < fonts.size(); ++i)
+                Write(std::to_string(i), fonts[i].data(), fonts[i].size());
+        } catch (...) {
+            Remove();
+            throw;
+        }
     }
-    ~ScriptFolder() {
-        std::error_code ignored;
-        std::filesystem::remove_all(path_, ignored);
-    }
+    ~ScriptFolder() { Remove(); }
     ScriptFolder(const ScriptFolder&) = delete;
     ScriptFolder& operator=(const ScriptFolder&) = delete;
 
     const std::string& Path() const { return path_; }
 
 private:
+    static std::string NewFolder() {
+        std::error_code error;
+        std::string path = (std::filesystem::temp_directory_path(error) / "movieconv-XXXXXX").string();
+        if (!error && mkdtemp(path.data()) == nullptr)
+            error = {errno, std::generic_category()};
+        if (error)
+            throw ScratchError(fmt::format("cannot make a folder for the subtitles: {}", error.message()));
+        return path;
+    }
+
+    void Remove() const {
+        std::error_code ignored;
+        std::filesystem::remove_all(path_, ignored);
+    }
+
     void Write(const std::string& name, const void* data, std::size_t size) const {
         std::ofstream file(path_ + "/" + name, std::ios::binary);
         file.write(static_cast<const char*>(data), static_cast<std::streamsize>(size));
@@ -61,7 +72,7 @@ private:
             throw ScratchError(fmt::format("cannot write the subtitles to \"{}\"", path_));
     }
 
-    std::string path_;
+    const std::string path_;
 };
 
 /// A value as it stands in a chain of filters: quoted once for the option and once for the chain.
@@ -201,14 +212,15 @@ public:
     Canvas Draw(int64_t time) override {
         if (active_.empty())
             return {};
-        av::Frame picture = NewCanvas();
+        const av::Frame canvas = NewCanvas();
         // The middle of the millisecond, lest rounding changes it.
-        picture->pts = time / (kTicksPerSecond / 1000) * 1000 + 500;
+        canvas->pts = time / (kTicksPerSecond / 1000) * 1000 + 500;
+        av::Frame drawn;
         Drawing([&] {
-            graph_->Push(*picture);
-            picture = graph_->Take();
+            graph_->Push(*canvas);
+            drawn = graph_->Take();
         });
-        return picture ? Trimmed(picture->data[0], picture->linesize[0], width_, height_) : Canvas{};
+        return drawn ? Trimmed(drawn->data[0], drawn->linesize[0], width_, height_) : Canvas{};
     }
 
 private:
