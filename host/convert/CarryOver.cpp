@@ -147,12 +147,6 @@ private:
     std::vector<Track> tracks_;
 };
 
-bool BelongTogether(const StreamInfo& one, const StreamInfo& other) {
-    return one.programs.empty() || std::any_of(one.programs.begin(), one.programs.end(), [&](int program) {
-               return std::count(other.programs.begin(), other.programs.end(), program) > 0;
-           });
-}
-
 bool CanBeHeard(const StreamInfo& stream) {
     return stream.decodable && stream.sound && stream.sound->sampleRate > 0 && stream.sound->channels > 0;
 }
@@ -168,7 +162,7 @@ std::string WhySoundStays(const SourceInfo& source, const StreamInfo& stream, co
         return "it cannot be decoded";
     if (copies && MWCarriesPackets(format.fccFormat, stream.codec.c_str()) == 0)
         return fmt::format("{} cannot hold it as it is", ShortName(format));
-    if (source.pictures && !BelongTogether(StreamAt(source, source.pictures->index), stream))
+    if (source.pictures && !BelongsTo(StreamAt(source, source.pictures->index).programs, stream))
         return "it belongs to another programme";
     return {};
 }

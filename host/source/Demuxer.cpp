@@ -2,6 +2,7 @@
 
 #include "host/source/MediaTime.h"
 #include "host/source/PacketTime.h"
+#include "host/source/StreamChoice.h"
 
 #include <algorithm>
 #include <limits>
@@ -32,13 +33,8 @@ std::vector<int> WitnessesIn(const SourceInfo& info, const AVFormatContext& cont
     std::vector<int> witnesses;
     const int converted = info.pictures ? info.pictures->index : info.sound->index;
     const std::vector<int>& programs = info.streams[static_cast<std::size_t>(converted)].programs;
-    const auto belongs = [&](const StreamInfo& stream) {
-        return programs == stream.programs || std::any_of(programs.begin(), programs.end(), [&](int program) {
-                   return std::count(stream.programs.begin(), stream.programs.end(), program) > 0;
-               });
-    };
     for (const StreamInfo& stream : info.streams)
-        if (MayJump(context) && belongs(stream) &&
+        if (MayJump(context) && BelongsTo(programs, stream) &&
             (stream.kind == StreamKind::kPictures || stream.kind == StreamKind::kSound))
             witnesses.push_back(stream.index);
     return witnesses;

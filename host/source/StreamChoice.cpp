@@ -27,12 +27,10 @@ auto PictureRank(const StreamInfo& stream) {
 }
 
 auto SoundRank(const StreamInfo& stream, const std::vector<int>& programs) {
-    const bool together = programs.empty() || std::any_of(programs.begin(), programs.end(), [&](int program) {
-                              return std::count(stream.programs.begin(), stream.programs.end(), program) > 0;
-                          });
     const bool forAll =
         !stream.flags.commentary && !stream.flags.hearingImpaired && !stream.flags.visualImpaired;
-    return std::tuple(together, forAll, stream.flags.isDefault, stream.sound->channels, -stream.index);
+    return std::tuple(BelongsTo(programs, stream), forAll, stream.flags.isDefault, stream.sound->channels,
+                      -stream.index);
 }
 
 /// The number of the stream with the highest rank among those that fit, -1 without one.
@@ -60,6 +58,12 @@ bool IsNumber(const std::string& text) {
 }
 
 } // namespace
+
+bool BelongsTo(const std::vector<int>& programs, const StreamInfo& stream) {
+    return programs.empty() || std::any_of(programs.begin(), programs.end(), [&](int program) {
+               return std::count(stream.programs.begin(), stream.programs.end(), program) > 0;
+           });
+}
 
 std::vector<int> WantedTracks(const std::vector<StreamInfo>& streams, StreamKind kind,
                               const TrackList& wanted) {

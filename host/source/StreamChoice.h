@@ -19,6 +19,9 @@ struct ChosenStreams {
 std::vector<int> WantedTracks(const std::vector<StreamInfo>& streams, StreamKind kind,
                               const TrackList& wanted);
 
+/// Whether the stream belongs to one of these programmes of a broadcast, or there are none.
+bool BelongsTo(const std::vector<int>& programs, const StreamInfo& stream);
+
 /// The pictures are those marked as default, of several the largest, of several the first. The sound belongs
 /// to the same broadcast programme, is no commentary and not made for people who see or hear little, if there
 /// is another; then as for pictures, with channels for size. Only what can be decoded.
