@@ -133,11 +133,12 @@ void Movie::AddBeside(int stream, std::unique_ptr<BesideTrack> track) {
 }
 
 void Movie::Stop() {
-    demuxer_.Stop();
+    // Before the demuxer, lest a decoder take the stop for the source's end and hand on what belongs there.
     if (pictures_)
         pictures_->Stop();
     if (sound_)
         sound_->Stop();
+    demuxer_.Stop();
 }
 
 std::optional<Shortfall> Movie::Missing() const {
