@@ -2,6 +2,7 @@
 
 #include "host/source/EarlierCues.h"
 #include "host/source/MediaTime.h"
+#include "host/source/PictureLosses.h"
 #include "host/source/SourceError.h"
 
 #include <fmt/format.h>
@@ -152,26 +153,13 @@ std::optional<Shortfall> Movie::Missing() const {
 }
 
 std::vector<std::string> Movie::Complaints() const {
-    constexpr int kMostDepth = 10; // of what is handed out
     std::vector<std::string> texts;
     if (const int64_t cues = cuesInOtherCharset_; cues > 0)
         texts.push_back(fmt::format("{} of its subtitles {} not in UTF-8 and taken for Windows-1252", cues,
                                     cues == 1 ? "was" : "were"));
-    if (pictures_ && pictures_->Deinterlaced())
-        texts.emplace_back("interlaced pictures were made progressive");
-    if (pictures_ && pictures_->LeftInterlaced())
-        texts.emplace_back("interlaced pictures stayed as they are, in files that do not tell it");
-    if (pictures_ && IsHdr(*Info().pictures) && !choice_.keepHdr)
-        texts.emplace_back("its HDR pictures were brought to the light and colours of BT.709");
-    else if (pictures_ && Info().pictures->depth > 8 && !choice_.deep)
-        texts.push_back(fmt::format("its pictures of {} bits got 8", Info().pictures->depth));
-    else if (pictures_ && Info().pictures->depth > kMostDepth)
-        texts.push_back(fmt::format("its pictures of {} bits got 10", Info().pictures->depth));
-    if (pictures_ && !Info().pictures->fineColours.empty())
-        texts.push_back(fmt::format("its {} pictures keep their colours at half the resolution (4:2:0)",
-                                    Info().pictures->fineColours));
-    if (pictures_ && Info().pictures->transparent)
-        texts.emplace_back("the transparency of its pictures was left out");
+    if (pictures_)
+        for (std::string& loss : PictureLosses(*Info().pictures, choice_, *pictures_))
+            texts.push_back(std::move(loss));
     if (const int jumps = demuxer_.ClockJumps(); jumps > 0) {
         texts.push_back(fmt::format("the source's clock jumped {}; the parts were joined",
                                     jumps == 1 ? "once" : fmt::format("{} times", jumps)));

@@ -156,6 +156,7 @@ bool PictureDecoder::Accept(AVFrame& frame) {
         return true;
     }
     ++decoded_;
+    notes_.Look(frame);
     std::optional<int64_t> stamp;
     if (frame.best_effort_timestamp != AV_NOPTS_VALUE)
         stamp = reader_.MediaTime(frame.best_effort_timestamp, timeBase_);

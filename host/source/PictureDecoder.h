@@ -12,6 +12,7 @@
 #include "host/source/LastStay.h"
 #include "host/source/PictureConverter.h"
 #include "host/source/PictureFilter.h"
+#include "host/source/PictureNotes.h"
 #include "host/source/StampRepair.h"
 #include "host/source/StreamDecoder.h"
 #include "host/source/SubtitleBurner.h"
@@ -56,6 +57,7 @@ public:
     int64_t Repaired() const { return repaired_; }
     bool Deinterlaced() const { return deinterlaced_; }
     bool LeftInterlaced() const { return leftInterlaced_; }
+    const PictureNotes& Notes() const { return notes_; }
 
     /// Whether the source's last picture has been decoded and handed on. Any thread.
     bool RanDry() const { return ranDry_; }
@@ -109,6 +111,7 @@ private:
     std::atomic<bool> ranDry_{false};
     std::atomic<bool> deinterlaced_{false};
     std::atomic<bool> leftInterlaced_{false};
+    PictureNotes notes_;
     std::thread thread_;
 
     // The engine worker's.

@@ -69,7 +69,10 @@ struct PictureStreamInfo {
     std::optional<MasteringDisplay> masteringDisplay;
     std::optional<LightLevel> lightLevel;
     bool dolbyVision = false;
-    Crop crop{}; ///< What is cut off; even numbers.
+    bool dolbyVisionAlone = false; ///< Whoever does not know it sees wrong colours.
+    bool stereoscopic = false;     ///< Holds the views of both eyes in one picture, by the container's word.
+    bool spherical = false;        ///< Shows all directions, or is to be projected otherwise.
+    Crop crop{};                   ///< What is cut off; even numbers.
 };
 
 /// Width to height of a pixel as shown.

@@ -15,7 +15,9 @@
 extern "C" {
 #include <libavutil/avstring.h>
 #include <libavutil/display.h>
+#include <libavutil/dovi_meta.h>
 #include <libavutil/pixdesc.h>
+#include <libavutil/stereo3d.h>
 }
 
 namespace movieconv {
@@ -111,14 +113,20 @@ AVRational PixelAspect(AVFormatContext& context, AVStream* stream, bool turned) 
     return turned ? av_inv_q(aspect) : aspect;
 }
 
-void ReadLight(const AVStream* stream, PictureStreamInfo& info) {
+void ReadSideData(const AVStream* stream, PictureStreamInfo& info) {
     const auto sideData = [&](AVPacketSideDataType type) {
         return av_stream_get_side_data(stream, type, nullptr);
     };
     TakeLight(
         reinterpret_cast<const AVMasteringDisplayMetadata*>(sideData(AV_PKT_DATA_MASTERING_DISPLAY_METADATA)),
         reinterpret_cast<const AVContentLightMetadata*>(sideData(AV_PKT_DATA_CONTENT_LIGHT_LEVEL)), info);
-    info.dolbyVision = sideData(AV_PKT_DATA_DOVI_CONF) != nullptr;
+    const auto* dolby =
+        reinterpret_cast<const AVDOVIDecoderConfigurationRecord*>(sideData(AV_PKT_DATA_DOVI_CONF));
+    info.dolbyVision = dolby != nullptr;
+    info.dolbyVisionAlone = dolby != nullptr && dolby->dv_bl_signal_compatibility_id == 0;
+    const auto* stereo = reinterpret_cast<const AVStereo3D*>(sideData(AV_PKT_DATA_STEREO3D));
+    info.stereoscopic = stereo != nullptr && stereo->type != AV_STEREO3D_2D;
+    info.spherical = sideData(AV_PKT_DATA_SPHERICAL) != nullptr;
 }
 
 /// Opacity beside VP9's pictures is told by a tag only. A GIF's pixels always have room for it, and hardly
@@ -176,7 +184,7 @@ PictureStreamInfo DescribePictures(AVFormatContext& context, AVStream* stream) {
     info.colorPrimaries = parameters.color_primaries;
     info.colorTransfer = parameters.color_trc;
     info.colorMatrix = MatrixOf(parameters);
-    ReadLight(stream, info);
+    ReadSideData(stream, info);
     return info;
 }
 

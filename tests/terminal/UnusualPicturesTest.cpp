@@ -67,6 +67,76 @@ TEST(UnusualPictures, WhatTheyLoseIsTold) {
     }
 }
 
+/// A movie whose first picture comes with three bytes of closed captions.
+std::string Captioned(const std::string& captions) {
+    std::string movie = ReadFile(Make("captioned.h264", Join(CountedPictures(0.2), Args{"-c:v", "libx264"})));
+    const std::string message =
+        "\x04\x0e\xb5" + std::string(1, '\0') + "\x31GA94\x03\x41\xff" + captions + "\xff";
+    const std::string start("\0\0\1", 3);
+    movie.insert(movie.find(start + "\x65"), start + "\x06" + message + "\x80");
+    return movie;
+}
+
+std::string Box(const std::string& name, const std::string& content) {
+    return std::string(3, '\0') + static_cast<char>(content.size() + 8) + name + content;
+}
+
+/// A movie in whose index such a box describes the pictures.
+std::string Described(const std::string& box) {
+    std::string movie =
+        ReadFile(Make("described.mp4", Join(CountedPictures(0.2), Args{"-an", "-c:v", "libx264"})));
+    const auto sizeAt = [&](std::size_t place) {
+        std::size_t size = 0;
+        for (std::size_t i = 0; i < 4; ++i)
+            size = size << 8 | static_cast<unsigned char>(movie[place + i]);
+        return size;
+    };
+    std::size_t place = 0;
+    for (const char* const parent : {"moov", "trak", "mdia", "minf", "stbl", "stsd", "avc1"}) {
+        place = movie.find(parent, place) - 4;
+        const std::size_t size = sizeAt(place) + box.size();
+        for (std::size_t i = 0; i < 4; ++i)
+            movie[place + i] = static_cast<char>(size >> (24 - 8 * i));
+    }
+    movie.insert(place + sizeAt(place) - box.size(), box);
+    return movie;
+}
+
+TEST(UnusualPictures, WhatIsToldBesideThemIsMissed) {
+    const std::string plain(4, '\0'); // version and flags of a box
+    const std::string dolby = {1, 0, 0x10, 0x0d};
+    const std::string sphere =
+        Box("svhd", plain + '\0') +
+        Box("proj", Box("prhd", plain + std::string(12, '\0')) + Box("equi", plain + std::string(16, '\0')));
+    const std::string captions = "closed captions";
+    const std::string eyes = "both eyes";
+    const std::string all = "spherical pictures";
+    const std::string added = "what Dolby Vision adds";
+    const std::string alone = "for Dolby Vision alone";
+    const struct {
+        const char* name;
+        std::string movie;
+        std::string told;
+    } cases[] = {
+        {"captions", Captioned("\xfc\x94\x20"), captions},
+        {"room for captions", Captioned("\xfc\x80\x80"), ""},
+        {"one eye", Described(Box("st3d", plain + '\0')), ""},
+        {"both eyes", Described(Box("st3d", plain + '\2')), eyes},
+        {"sphere", Described(Box("sv3d", sphere)), all},
+        {"Dolby Vision", Described(Box("dvcC", dolby + '\x10' + std::string(19, '\0'))), added},
+        {"alone", Described(Box("dvcC", dolby + std::string(20, '\0'))), alone},
+    };
+    for (const auto& test : cases) {
+        SCOPED_TRACE(test.name);
+        const Folder folder;
+        WriteFile(folder / "source", test.movie);
+        const Result result = Call({"--preset", "classic", folder / "source", folder / "o.mp4"});
+        ASSERT_EQ(result.code, 0) << result.err;
+        for (const std::string& text : {captions, eyes, all, added, alone})
+            EXPECT_EQ(result.err.find(text) != std::string::npos, text == test.told) << text << result.err;
+    }
+}
+
 /// Labelled as RGB or not, in sizes for which players take different matrices.
 TEST(UnusualPictures, RgbIsShownInItsColoursByWhatTheOutputSays) {
     const struct {

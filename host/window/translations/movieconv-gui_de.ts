@@ -962,6 +962,26 @@
         <translation>die Durchsichtigkeit der Bilder wurde weggelassen</translation>
     </message>
     <message>
+        <source>what Dolby Vision adds to its pictures was left out</source>
+        <translation>was Dolby Vision den Bildern hinzufügt, wurde weggelassen</translation>
+    </message>
+    <message>
+        <source>its colours are made for Dolby Vision alone, and are wrong without it</source>
+        <translation>die Farben sind allein für Dolby Vision gemacht und ohne es falsch</translation>
+    </message>
+    <message>
+        <source>its closed captions were left out</source>
+        <translation>die verborgenen Untertitel (Closed Captions) wurden weggelassen</translation>
+    </message>
+    <message>
+        <source>pictures for both eyes stayed as they are, in files that do not tell it</source>
+        <translation>Bilder für beide Augen blieben, wie sie sind, in Dateien, die es nicht sagen</translation>
+    </message>
+    <message>
+        <source>spherical pictures stayed as they are, in files that do not tell it</source>
+        <translation>Rundumbilder blieben, wie sie sind, in Dateien, die es nicht sagen</translation>
+    </message>
+    <message>
         <source>the source&apos;s clock jumped once; the parts were joined</source>
         <translation>die Zeit der Quelle sprang einmal; die Stücke wurden aneinandergefügt</translation>
     </message>
