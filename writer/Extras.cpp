@@ -114,12 +114,11 @@ Cover MakeCover(const void* data, int64_t size) {
 }
 
 std::vector<Chapter> ChaptersWithin(const std::vector<Chapter>& chapters, int64_t begin, int64_t length) {
-    constexpr int64_t kShortest = kTicksPerSecond / 1000; // a cut lies beside a chapter's border by less
     std::vector<Chapter> within;
     for (const Chapter& chapter : chapters) {
         const int64_t from = std::max<int64_t>(0, chapter.begin - begin);
         const int64_t to = std::min(length, chapter.end - begin);
-        if (to - from >= kShortest)
+        if (to - from >= kWriterShortestChapter)
             within.push_back({from, to, chapter.title});
     }
     std::stable_sort(within.begin(), within.end(),

@@ -334,8 +334,11 @@ int64_t MWGetLostCues(uint32_t set, int track);
 /// subtitles as they are, or subtitles of text as other ones. Else 0.
 int MWCarriesPackets(uint32_t format, const char* codec);
 
+/// 100 ns units. No file gets less of a chapter: a cut may lie beside a chapter's border by as much.
+enum { kWriterShortestChapter = 10000 };
+
 /// A chapter, in the source's time (100 ns units). Each file gets what lies in it, on its own timeline, when
-/// it is closed. `title` may be null.
+/// it is closed, unless that is shorter than kWriterShortestChapter. `title` may be null.
 int MWAddChapter(uint32_t set, int64_t begin, int64_t end, const char* title);
 
 /// A cover, as JPEG or PNG; a second call replaces it. In MP4, MOV and M4A it comes with the close.

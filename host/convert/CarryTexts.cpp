@@ -99,9 +99,8 @@ std::string LanguageIn(const FileFormatInfo& format, const StreamInfo& stream) {
     return {};
 }
 
-/// No file gets a chapter of less than a millisecond.
 bool HasLength(const Chapter& chapter) {
-    return Ticks(chapter.end) - Ticks(chapter.begin) >= kTicksPerSecond / 1000;
+    return Ticks(chapter.end) - Ticks(chapter.begin) >= kWriterShortestChapter;
 }
 
 /// How many chapters were left out, because they make no sense.

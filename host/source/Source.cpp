@@ -1,21 +1,14 @@
 #include "host/source/Source.h"
 
-#include "host/source/Languages.h"
 #include "host/source/Probe.h"
 #include "host/source/SourceTexts.h"
 #include "host/source/StreamChoice.h"
 #include "host/source/StreamDescription.h"
-#include "host/source/SubtitleFile.h"
 
-#include <algorithm>
 #include <cstddef>
 #include <fmt/format.h>
 #include <utility>
 #include <vector>
-
-extern "C" {
-#include <libavutil/avstring.h>
-}
 
 namespace movieconv {
 namespace {
@@ -25,65 +18,6 @@ std::string NothingToConvert(const std::string& path, const SourceChoice& choice
                        choice.pictures && choice.sound ? "pictures and no sound"
                        : choice.pictures               ? "pictures"
                                                        : "sound");
-}
-
-/// Puts the text in the place of that of the same name, where there is one.
-void ReplaceTag(std::vector<Tag>& tags, const std::string& key, const std::string& text) {
-    const auto known = std::find_if(tags.begin(), tags.end(), [&](const Tag& tag) {
-        return av_strcasecmp(tag.key.c_str(), key.c_str()) == 0;
-    });
-    if (known != tags.end() && !text.empty())
-        known->value = ToUtf8(text, "");
-}
-
-/// Of a chapter's titles the first one is what people gave it first.
-void PreferFirstTitles(const std::vector<ContainerNotes::Titles>& titles, std::vector<Chapter>& chapters) {
-    auto next = chapters.begin();
-    for (const ContainerNotes::Titles& each : titles) {
-        const auto found = std::find_if(next, chapters.end(), [&](const Chapter& chapter) {
-            return chapter.title == ToUtf8(each.last, "");
-        });
-        if (found != chapters.end()) {
-            found->title = ToUtf8(each.first, "");
-            next = found + 1;
-        }
-    }
-}
-
-/// Gives attached files what is said of them, each to the first one of its name that has nothing yet.
-void DescribeFiles(const std::vector<ContainerNotes::File>& files, std::vector<StreamInfo>& streams) {
-    for (const ContainerNotes::File& file : files) {
-        const auto stream = std::find_if(streams.begin(), streams.end(), [&](const StreamInfo& each) {
-            return each.kind == StreamKind::kAttachment && each.title.empty() &&
-                   each.fileName == ToUtf8(file.name, "");
-        });
-        if (stream != streams.end())
-            stream->title = ToUtf8(file.description, "");
-    }
-}
-
-/// Where the container tells more than FFmpeg reads.
-void TakeNotes(const ContainerNotes& notes, SourceInfo& info) {
-    for (std::size_t i = 0; i < info.streams.size(); ++i) {
-        StreamInfo& stream = info.streams[i];
-        const std::string& tag = notes.streams[i].languageTag;
-        const std::string language = ThreeLetters(tag.substr(0, tag.find('-')));
-        if (LanguageName(language) != language) // it is a known one
-            stream.language = language != ThreeLetters(stream.language) ? language : stream.language;
-        if (tag.find('-') != std::string::npos || language != ThreeLetters(stream.language))
-            stream.languageTag = tag;
-        if (stream.title.empty())
-            stream.title = ToUtf8(notes.streams[i].title, "");
-    }
-    for (const Tag& tag : notes.repeated)
-        ReplaceTag(info.tags, tag.key, tag.value);
-    ReplaceTag(info.tags, "title", notes.title);
-    DescribeFiles(notes.files, info.streams);
-    PreferFirstTitles(notes.titles, info.chapters);
-    info.furtherTitles = static_cast<int>(notes.titles.size());
-    const int unread = std::max(notes.chapters - static_cast<int>(info.chapters.size()), 0);
-    info.disorderedChapters = std::min(notes.disordered, unread);
-    info.unreadChapters = unread - info.disorderedChapters;
 }
 
 } // namespace

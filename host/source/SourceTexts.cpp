@@ -1,5 +1,8 @@
 #include "host/source/SourceTexts.h"
 
+#include "host/source/Languages.h"
+#include "host/source/SubtitleFile.h"
+
 #include <algorithm>
 #include <cctype>
 #include <cstddef>
@@ -13,10 +16,15 @@ extern "C" {
 namespace movieconv {
 namespace {
 
+/// The text of that name, in any case, in `tags`, which may be constant.
+template <class Tags>
+auto FindTag(Tags& tags, const std::string& key) {
+    return std::find_if(tags.begin(), tags.end(),
+                        [&](const Tag& tag) { return av_strcasecmp(tag.key.c_str(), key.c_str()) == 0; });
+}
+
 const Tag* TextAt(const std::vector<Tag>& tags, const std::string& key) {
-    const auto found = std::find_if(tags.begin(), tags.end(), [&](const Tag& tag) {
-        return av_strcasecmp(tag.key.c_str(), key.c_str()) == 0;
-    });
+    const auto found = FindTag(tags, key);
     return found != tags.end() ? &*found : nullptr;
 }
 
@@ -74,7 +82,63 @@ void DropCopies(std::vector<Tag>& tags) {
     RemoveIf(tags, isCopy);
 }
 
+/// Puts the text in the place of that of the same name, where there is one.
+void ReplaceTag(std::vector<Tag>& tags, const std::string& key, const std::string& text) {
+    const auto known = FindTag(tags, key);
+    if (known != tags.end() && !text.empty())
+        known->value = ToUtf8(text, "");
+}
+
+/// Of a chapter's titles the first one is what people gave it first.
+void PreferFirstTitles(const std::vector<ContainerNotes::Titles>& titles, std::vector<Chapter>& chapters) {
+    auto next = chapters.begin();
+    for (const ContainerNotes::Titles& each : titles) {
+        const auto found = std::find_if(next, chapters.end(), [&](const Chapter& chapter) {
+            return chapter.title == ToUtf8(each.last, "");
+        });
+        if (found != chapters.end()) {
+            found->title = ToUtf8(each.first, "");
+            next = found + 1;
+        }
+    }
+}
+
+/// Gives attached files what is said of them, each to the first one of its name that has nothing yet.
+void DescribeFiles(const std::vector<ContainerNotes::File>& files, std::vector<StreamInfo>& streams) {
+    for (const ContainerNotes::File& file : files) {
+        const auto stream = std::find_if(streams.begin(), streams.end(), [&](const StreamInfo& each) {
+            return each.kind == StreamKind::kAttachment && each.title.empty() &&
+                   each.fileName == ToUtf8(file.name, "");
+        });
+        if (stream != streams.end())
+            stream->title = ToUtf8(file.description, "");
+    }
+}
+
 } // namespace
+
+void TakeNotes(const ContainerNotes& notes, SourceInfo& info) {
+    for (std::size_t i = 0; i < info.streams.size(); ++i) {
+        StreamInfo& stream = info.streams[i];
+        const std::string& tag = notes.streams[i].languageTag;
+        const std::string language = ThreeLetters(tag.substr(0, tag.find('-')));
+        if (LanguageName(language) != language) // it is a known one
+            stream.language = language != ThreeLetters(stream.language) ? language : stream.language;
+        if (tag.find('-') != std::string::npos || language != ThreeLetters(stream.language))
+            stream.languageTag = tag;
+        if (stream.title.empty())
+            stream.title = ToUtf8(notes.streams[i].title, "");
+    }
+    for (const Tag& tag : notes.repeated)
+        ReplaceTag(info.tags, tag.key, tag.value);
+    ReplaceTag(info.tags, "title", notes.title);
+    DescribeFiles(notes.files, info.streams);
+    PreferFirstTitles(notes.titles, info.chapters);
+    info.furtherTitles = static_cast<int>(notes.titles.size());
+    const int unread = std::max(notes.chapters - static_cast<int>(info.chapters.size()), 0);
+    info.disorderedChapters = std::min(notes.disordered, unread);
+    info.unreadChapters = unread - info.disorderedChapters;
+}
 
 void PutTextsRight(std::string_view container, SourceInfo& info) {
     if (container == "ogg")
