@@ -11,9 +11,10 @@
 #include <map>
 #include <mutex>
 
-/// Handles the window's events until `condition` holds. False after five minutes.
+/// Handles the window's events until `condition` holds. False after fifteen minutes, since conversions give
+/// way to whatever else is running.
 inline bool Await(const std::function<bool()>& condition) {
-    return QTest::qWaitFor(condition, 300'000);
+    return QTest::qWaitFor(condition, 900'000);
 }
 
 class ScriptedRunner : public movieconv::window::Runner {
