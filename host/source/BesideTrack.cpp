@@ -18,7 +18,8 @@ constexpr int64_t kLongest =
 bool BesideTrack::Next(int64_t until, bool closing, Item& item) {
     if (closing) {
         const int64_t fileEnd = bounds_.fileEnd;
-        until = fileEnd != BesideBounds::kOpen || !bounds_.ends ? fileEnd : until;
+        const bool endsHere = bounds_.ends || bounds_.stopped;
+        until = fileEnd != BesideBounds::kOpen || !endsHere ? fileEnd : until;
     }
     bool found = false;
     item.time = until;

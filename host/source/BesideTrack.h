@@ -27,6 +27,7 @@ struct BesideBounds {
     bool ends = false;                   ///< The last file ends before the source does.
     bool isCut = false;                  ///< There are several files.
     std::atomic<int64_t> fileEnd{kOpen}; ///< Where the next file begins, once it is known that one follows.
+    std::atomic<bool> stopped{false};    ///< The last file ends where pictures and sound do.
 };
 
 /// One thread at a time takes from it.

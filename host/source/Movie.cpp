@@ -134,11 +134,13 @@ void Movie::AddBeside(int stream, std::unique_ptr<BesideTrack> track) {
 }
 
 void Movie::Stop() {
-    // Before the demuxer, lest a decoder take the stop for the source's end and hand on what belongs there.
-    if (pictures_)
-        pictures_->Stop();
+    bounds_.stopped = true;
+    // Before the demuxer, lest a decoder take the stop for the source's end and hand on what belongs there;
+    // the sound first, which goes on where pictures end.
     if (sound_)
         sound_->Stop();
+    if (pictures_)
+        pictures_->Stop();
     demuxer_.Stop();
 }
 

@@ -38,7 +38,7 @@ int Rounds() {
 }
 
 struct Usage {
-    int64_t threads = CountEntries("/proc/self/task");
+    int64_t threads = CountThreads();
     int64_t descriptors = CountEntries("/proc/self/fd");
     int64_t memory = static_cast<int64_t>(mallinfo2().uordblks); ///< Bytes in use, of all threads together.
 };

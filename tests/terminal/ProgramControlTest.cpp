@@ -31,8 +31,7 @@ class ProgramSignal : public testing::TestWithParam<int> {};
 TEST_P(ProgramSignal, FinishesAPlayableFile) {
     const Folder folder;
     Running running(Join(Slowly(folder / "out.mp4"), Args{"--progress", "json"}), false);
-    for (int report = 0; report < 4; ++report)
-        ASSERT_TRUE(running.WaitFor("\"event\":\"progress\""));
+    ASSERT_TRUE(running.WaitFor("\"position_s\":[1-9]"));
     running.Signal(GetParam());
     const Result result = running.Finish();
     EXPECT_EQ(result.code, 6) << result.out;
@@ -121,7 +120,7 @@ TEST(Program, LeavesTheTerminalAsItWasWhenItIsToldToQuitAtOnce) {
     setrlimit(RLIMIT_CORE, &none);
     Running running(Slowly(folder / "out.mp4"), true);
     setrlimit(RLIMIT_CORE, &usual);
-    ASSERT_TRUE(running.WaitFor("left"));
+    ASSERT_TRUE(running.WaitFor("0:00:0[1-9] / ")); // the file is open
     EXPECT_FALSE(running.Echoes());
     running.Press("\x1c"); // Ctrl-backslash
     ASSERT_TRUE(running.WaitFor("what was written so far is in .*out.mp4.part"));
@@ -153,6 +152,23 @@ TEST_P(ProgramStalls, AndStops) {
 }
 
 INSTANTIATE_TEST_SUITE_P(Begins, ProgramStalls, testing::Values("0", "6"));
+
+TEST(Program, AStopEndsTheSubtitlesToo) {
+    const Folder folder;
+    WriteFile(
+        folder / "cues.srt",
+        "1\n00:00:00,500 --> 00:00:00,900\nFirst words\n\n2\n00:00:59,000 --> 00:00:59,500\nLast words\n");
+    Running running(
+        Join(Slowly(folder / "out.mkv"), Args{"--subtitle-file", folder / "cues.srt", "--progress", "json"}),
+        false);
+    ASSERT_TRUE(running.WaitFor("\"position_s\":[1-9]"));
+    running.Signal(SIGINT);
+    const Result result = running.Finish();
+    EXPECT_EQ(result.code, 6) << result.out;
+    const std::string movie = ReadFile(folder / "out.mkv");
+    EXPECT_NE(movie.find("First words"), std::string::npos);
+    EXPECT_EQ(movie.find("Last words"), std::string::npos);
+}
 
 TEST(Program, StopsWhileAFileOfSubtitlesBringsNothing) {
     const Folder folder;

@@ -138,7 +138,7 @@ void ConvertUntilKilled(const std::string& folder) {
 TEST_F(PicturesTest, ComesBackAfterAKill) {
     if (const char* killed = std::getenv(kKilled))
         return ConvertUntilKilled(killed);
-    std::filesystem::copy_file(Holiday(), folder / "movie.mkv");
+    std::filesystem::copy_file(Holiday(10), folder / "movie.mkv");
     setenv(kKilled, folder.Path().c_str(), 1);
     const pid_t child = fork();
     if (child == 0) {
