@@ -34,9 +34,9 @@ void PictureNotes::Look(const AVFrame& frame) {
     const AVFrameSideData* captions = av_frame_get_side_data(&frame, AV_FRAME_DATA_A53_CC);
     if (captions != nullptr && !captioned_)
         captioned_ = HoldsCaptions(*captions);
-    if (const AVFrameSideData* stereo = av_frame_get_side_data(&frame, AV_FRAME_DATA_STEREO3D))
-        stereoscopic_ =
-            stereoscopic_ || reinterpret_cast<const AVStereo3D*>(stereo->data)->type != AV_STEREO3D_2D;
+    const AVFrameSideData* stereo = av_frame_get_side_data(&frame, AV_FRAME_DATA_STEREO3D);
+    if (stereo != nullptr && reinterpret_cast<const AVStereo3D*>(stereo->data)->type != AV_STEREO3D_2D)
+        stereoscopic_ = true;
 }
 
 } // namespace movieconv

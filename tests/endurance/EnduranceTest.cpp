@@ -6,6 +6,7 @@
 #include "platform/Platform.h"
 #include "tests/engine/IdleParts.h"
 #include "tests/support/Folder.h"
+#include "tests/support/Process.h"
 
 #ifdef MOVIECONV_RECORDED
 #include "tests/recorder/RecordingWriter.h"

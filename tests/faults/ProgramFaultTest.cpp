@@ -109,8 +109,14 @@ TEST(LogFault, AStallIsNamed) {
     const auto logged = [&](const char* line) {
         return ReadFile(folder / "log").find(line) != std::string::npos;
     };
-    while (!logged("A decoder waits for the source for ") ||
-           !logged("The conversion waits for the picture decoder for "))
+    const auto waitsFiveSeconds = [&](const std::string& who) {
+        const std::string log = ReadFile(folder / "log");
+        const std::string line = who + " for ";
+        const std::size_t at = log.find(line);
+        return at != std::string::npos && std::atof(&log[at + line.size()]) >= 5;
+    };
+    while (!waitsFiveSeconds("A decoder waits for the source") ||
+           !waitsFiveSeconds("The conversion waits for the picture decoder"))
         std::this_thread::sleep_for(std::chrono::milliseconds(20));
     to.write(bytes.data() + half, static_cast<std::streamsize>(bytes.size()) - half);
     to.close();

@@ -28,7 +28,7 @@ TEST(StallTest, BothSidesOfAQueueAreNamedOnce) {
     recorder::Reset();
     BoundedQueue<int> queue(1, 1, kSides);
     std::thread taker([&] { EXPECT_EQ(queue.Pop(), 1); });
-    AwaitLine("B waits for items for ");
+    AwaitLine("B waits for items for 0.");
     EXPECT_TRUE(queue.Push(1));
     taker.join();
     EXPECT_EQ(Lines("B waits for items"), 2);
@@ -36,7 +36,7 @@ TEST(StallTest, BothSidesOfAQueueAreNamedOnce) {
 
     EXPECT_TRUE(queue.Push(2));
     std::thread giver([&] { EXPECT_FALSE(queue.Push(3)); });
-    AwaitLine("A waits for room for ");
+    AwaitLine("A waits for room for 0.");
     queue.Close();
     giver.join();
     EXPECT_EQ(Lines("A waits for room"), 2);
@@ -51,7 +51,7 @@ TEST(BoundedQueueTest, RoomIsAwaitedBeforeTheItemIsMade) {
         while (queue.WaitForRoom(1))
             queue.Push(++made, 1);
     });
-    AwaitLine("A waits for room for ");
+    AwaitLine("A waits for room for 0.");
     EXPECT_EQ(made, 1);
     EXPECT_EQ(queue.Pop(), 1);
     EXPECT_EQ(queue.Pop(), 2);

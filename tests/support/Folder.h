@@ -3,7 +3,6 @@
 #define MOVIECONV_TESTS_SUPPORT_FOLDER_H
 
 #include <algorithm>
-#include <chrono>
 #include <cstdint>
 #include <cstdlib>
 #include <filesystem>
@@ -12,7 +11,6 @@
 #include <stdexcept>
 #include <string>
 #include <system_error>
-#include <thread>
 #include <vector>
 
 /// A folder that goes away with all that is in it.
@@ -49,20 +47,6 @@ private:
 inline int64_t CountEntries(const std::string& path) {
     const std::filesystem::directory_iterator entries(path);
     return std::distance(begin(entries), end(entries));
-}
-
-/// Threads of this process, when their number has stayed the same for a while: the kernel may count one for a
-/// moment after it was joined.
-inline int64_t CountThreads() {
-    constexpr int kWhile = 20; // milliseconds
-    int64_t count = CountEntries("/proc/self/task");
-    for (int same = 0; same < kWhile; ++same) {
-        std::this_thread::sleep_for(std::chrono::milliseconds(1));
-        const int64_t now = CountEntries("/proc/self/task");
-        same = now == count ? same : 0;
-        count = now;
-    }
-    return count;
 }
 
 /// What is in a file; nothing when it cannot be read.

@@ -1,10 +1,15 @@
-// Processes of a test's own.
+// Processes of a test's own, and the test's.
 #ifndef MOVIECONV_TESTS_SUPPORT_PROCESS_H
 #define MOVIECONV_TESTS_SUPPORT_PROCESS_H
 
+#include "tests/support/Folder.h"
+
+#include <chrono>
+#include <cstdint>
 #include <cstdio>
 #include <cstdlib>
 #include <string>
+#include <thread>
 
 #include <sys/wait.h>
 #include <unistd.h>
@@ -25,6 +30,20 @@ inline int AwaitEnd(pid_t child) {
     int status = 0;
     waitpid(child, &status, 0);
     return WIFEXITED(status) ? WEXITSTATUS(status) : 128 + WTERMSIG(status);
+}
+
+/// Threads of this process, when their number has stayed the same for a while: the kernel may count one for a
+/// moment after it was joined.
+inline int64_t CountThreads() {
+    constexpr int kWhile = 20; // milliseconds
+    int64_t count = CountEntries("/proc/self/task");
+    for (int same = 0; same < kWhile; ++same) {
+        std::this_thread::sleep_for(std::chrono::milliseconds(1));
+        const int64_t now = CountEntries("/proc/self/task");
+        same = now == count ? same : 0;
+        count = now;
+    }
+    return count;
 }
 
 /// What has been written into a file, which is closed.

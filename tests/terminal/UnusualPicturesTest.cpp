@@ -113,6 +113,7 @@ TEST(UnusualPictures, WhatIsToldBesideThemIsMissed) {
     const std::string all = "spherical pictures";
     const std::string added = "what Dolby Vision adds";
     const std::string alone = "for Dolby Vision alone";
+    const Args packing{"-c:v", "libx264", "-x264-params", "frame-packing=3"}; // told by the pictures alone
     const struct {
         const char* name;
         std::string movie;
@@ -122,6 +123,8 @@ TEST(UnusualPictures, WhatIsToldBesideThemIsMissed) {
         {"room for captions", Captioned("\xfc\x80\x80"), ""},
         {"one eye", Described(Box("st3d", plain + '\0')), ""},
         {"both eyes", Described(Box("st3d", plain + '\2')), eyes},
+        {"both eyes by the pictures", ReadFile(Make("packed.h264", Join(CountedPictures(0.2), packing))),
+         eyes},
         {"sphere", Described(Box("sv3d", sphere)), all},
         {"Dolby Vision", Described(Box("dvcC", dolby + '\x10' + std::string(19, '\0'))), added},
         {"alone", Described(Box("dvcC", dolby + std::string(20, '\0'))), alone},

@@ -2,6 +2,7 @@
 // written can be played, and nobody waits for ever.
 #include "MovieReader.h"
 #include "tests/support/Folder.h"
+#include "tests/support/Process.h"
 #include "writer/FileSystem.h"
 #include "writer/MediaFile.h"
 #include "writer/OptionSets.h"
