@@ -85,6 +85,28 @@ inline Frame NewFrame() {
     Frame frame(av_frame_alloc());
     return frame ? std::move(frame) : throw std::bad_alloc();
 }
+/// With the defaults of `codec`, which may be null.
+inline CodecContext NewCodecContext(const AVCodec* codec) {
+    CodecContext context(avcodec_alloc_context3(codec));
+    return context ? std::move(context) : throw std::bad_alloc();
+}
+inline CodecParameters NewParameters() {
+    CodecParameters parameters(avcodec_parameters_alloc());
+    return parameters ? std::move(parameters) : throw std::bad_alloc();
+}
+
+/// One more reference to the same data. Throws std::bad_alloc.
+inline Packet CopyOf(const AVPacket& packet) {
+    Packet copy(av_packet_clone(&packet));
+    return copy ? std::move(copy) : throw std::bad_alloc();
+}
+
+/// Parameters that outlive their stream. Throws std::bad_alloc.
+inline CodecParameters CopyOf(const AVCodecParameters& parameters) {
+    CodecParameters copy = NewParameters();
+    CheckMemory(avcodec_parameters_copy(copy.get(), &parameters));
+    return copy;
+}
 
 /// An AVIOContext with a buffer of its own. Throws std::bad_alloc.
 inline Io NewIo(int bufferSize, bool forWriting, void* opaque, int (*read)(void*, uint8_t*, int),

@@ -101,9 +101,7 @@ void FuzzScript(FuzzedDataProvider& input, const std::string& path, std::vector<
         return;
     const SubtitleFile file(path, "");
     CueList list;
-    list.parameters.reset(avcodec_parameters_alloc());
-    FUZZ_CHECK(list.parameters &&
-               avcodec_parameters_copy(list.parameters.get(), file.Stream().codecpar) >= 0);
+    list.parameters = av::CopyOf(*file.Stream().codecpar);
     for (av::Packet& packet : packets) {
         const int64_t begin = av_rescale_q(packet->pts, file.Stream().time_base, {1, kTicksPerSecond});
         const int64_t end = begin + WildInteger<int64_t>(input, kSecond) % (100000 * kSecond);

@@ -67,8 +67,7 @@ void AddSubtitles(FuzzedDataProvider& input, uint32_t set, Cues& cues) {
         cues.times.emplace_back(Time(input), input.ConsumeIntegralInRange<int64_t>(0, 2 * kSecond));
         cues.texts.push_back(Text(input));
     }
-    av::CodecParameters parameters(avcodec_parameters_alloc());
-    FUZZ_CHECK(parameters != nullptr);
+    const av::CodecParameters parameters = av::NewParameters();
     parameters->codec_type = AVMEDIA_TYPE_SUBTITLE;
     parameters->codec_id = input.PickValueInArray(
         {AV_CODEC_ID_SUBRIP, AV_CODEC_ID_WEBVTT, AV_CODEC_ID_TEXT, AV_CODEC_ID_DVB_SUBTITLE});

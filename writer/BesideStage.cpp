@@ -20,9 +20,7 @@ public:
         : plan_(plan),
           carriage_(FindCarriage(container, plan.sound->codec->code)),
           stage_(*plan.sound, flags),
-          parameters_(avcodec_parameters_alloc()) {
-        if (!parameters_)
-            throw std::bad_alloc();
+          parameters_(av::NewParameters()) {
         av::CheckMemory(avcodec_parameters_from_context(parameters_.get(), &stage_.Encoder()));
     }
 

@@ -5,17 +5,13 @@
 #include "writer/WriterFailure.h"
 #include "writer/WriterStatus.h"
 
-#include <new>
-
 namespace writer {
 
 av::CodecContext NewEncoder(const AVCodec* codec, uint32_t code, EncoderFlags flags) {
     if (codec == nullptr)
         throw WriterFailure(kWriterErrorCodec,
                             "This build of FFmpeg cannot encode \"" + CodeText(code) + "\".");
-    av::CodecContext context(avcodec_alloc_context3(codec));
-    if (!context)
-        throw std::bad_alloc();
+    av::CodecContext context = av::NewCodecContext(codec);
     if (flags.globalHeader)
         context->flags |= AV_CODEC_FLAG_GLOBAL_HEADER;
     if (flags.bitExact)

@@ -87,11 +87,7 @@ bool AddTrack(Extras& extras, const WriterTrack* track) {
                track->pContext,
                std::make_shared<std::atomic<int64_t>>(0)};
     if (!isSound) {
-        made.parameters =
-            std::shared_ptr<AVCodecParameters>(avcodec_parameters_alloc(), av::CodecParametersFree());
-        if (!made.parameters)
-            throw std::bad_alloc();
-        av::CheckMemory(avcodec_parameters_copy(made.parameters.get(), track->pParameters));
+        made.parameters = av::CopyOf(*track->pParameters);
     }
     extras.tracks.push_back(std::move(made));
     return true;

@@ -48,8 +48,8 @@ EncoderFlags FlagsFor(const FilePlan& plan) {
 int AddEncoder(PacketWriter& file, const AVCodecContext& context, AVRational unit, AVRational rate,
                int64_t runUp, const Carriage& carriage, const TrackLabel& label,
                const HdrLight* light = nullptr) {
-    const av::CodecParameters parameters(avcodec_parameters_alloc());
-    if (!parameters || avcodec_parameters_from_context(parameters.get(), &context) < 0)
+    const av::CodecParameters parameters = av::NewParameters();
+    if (avcodec_parameters_from_context(parameters.get(), &context) < 0)
         throw std::bad_alloc();
     return file.AddStream(
         {parameters.get(), unit, rate, context.sample_aspect_ratio, runUp, &carriage, &label, light});

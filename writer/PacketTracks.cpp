@@ -38,10 +38,7 @@ const Carriage kAsUsual{};
 class PacketTrack : public BesideTrack {
 public:
     PacketTrack(const Track& track, AVRational unit)
-        : track_(track), unit_(unit), parameters_(avcodec_parameters_alloc()) {
-        if (!parameters_)
-            throw std::bad_alloc();
-    }
+        : track_(track), unit_(unit), parameters_(av::NewParameters()) {}
 
     MuxedStream Stream() const override {
         return {parameters_.get(), unit_, {0, 1}, {0, 1}, 0, &kAsUsual, &track_.label};
@@ -66,9 +63,7 @@ protected:
             HandOnEmpty(*end_, begin);
         end_ = end;
         for (; fillsTime && end - begin > kLongest; begin += kLongest) {
-            const av::Packet part(av_packet_clone(&packet));
-            if (!part)
-                throw std::bad_alloc();
+            const av::Packet part = av::CopyOf(packet);
             Send(*part, begin, kLongest);
         }
         Send(packet, begin, end - begin);
@@ -118,9 +113,7 @@ public:
         const bool isBefore = ends && time + item.llDuration <= 0;
         if (isBefore || IsEmptyText(*item.pPacket))
             return true;
-        const av::Packet packet(av_packet_clone(item.pPacket));
-        if (!packet)
-            throw std::bad_alloc();
+        const av::Packet packet = av::CopyOf(*item.pPacket);
         const int64_t begin = std::max<int64_t>(time, 0);
         HandOn(*packet, begin, ends ? time + item.llDuration - begin : 0);
         return true;
@@ -159,9 +152,7 @@ public:
     }
 
     bool Take(const WriterTrackItem& item, int64_t time) override {
-        const av::Packet packet(av_packet_clone(item.pPacket));
-        if (!packet)
-            throw std::bad_alloc();
+        const av::Packet packet = av::CopyOf(*item.pPacket);
         const int64_t begin = av_rescale_q(time, kTick, unit_);
         const bool follows = end_ && std::abs(begin - *end_) <= kRounding;
         packet->pts = packet->dts =
@@ -202,9 +193,7 @@ struct SubtitleFree {
 
 av::CodecContext OpenCues(const AVCodec* codec, const AVCodecParameters* parameters,
                           const AVCodecContext* header) {
-    av::CodecContext context(avcodec_alloc_context3(codec));
-    if (!context)
-        throw std::bad_alloc();
+    av::CodecContext context = av::NewCodecContext(codec);
     if (parameters != nullptr)
         av::CheckMemory(avcodec_parameters_to_context(context.get(), parameters));
     context->time_base = {1, 1000};
@@ -260,9 +249,7 @@ public:
 
 private:
     std::vector<std::string> Decode(const AVPacket& source) {
-        const av::Packet packet(av_packet_clone(&source));
-        if (!packet)
-            throw std::bad_alloc();
+        const av::Packet packet = av::CopyOf(source);
         packet->pts = packet->dts = 0;
         packet->duration = 1;
         if (packet->size > kMostOfText) {

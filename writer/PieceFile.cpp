@@ -158,11 +158,7 @@ void PutBeside(AVIOContext& io, const AVPacket& packet) {
 } // namespace
 
 int PieceWriter::AddStream(const MuxedStream& stream) {
-    av::CodecParameters parameters(avcodec_parameters_alloc());
-    if (!parameters)
-        throw std::bad_alloc();
-    av::CheckMemory(avcodec_parameters_copy(parameters.get(), stream.parameters));
-    State state{stream, std::move(parameters)};
+    State state{stream, av::CopyOf(*stream.parameters)};
     state.description.parameters = state.parameters.get();
     // cppcheck-suppress danglingLifetime ; the parameters move along and stay where they are
     streams_.push_back(std::move(state));
@@ -265,9 +261,7 @@ PieceReader::Description PieceReader::ReadDescription(const uint8_t* data, std::
     }
     stream.runUp = draw.Number();
     stream.codec = static_cast<uint32_t>(draw.Number());
-    stream.parameters.reset(avcodec_parameters_alloc());
-    if (!stream.parameters)
-        throw std::bad_alloc();
+    stream.parameters = av::NewParameters();
     AVCodecParameters& parameters = *stream.parameters;
     Numbers(parameters,
             [&draw](auto& value) { value = static_cast<std::decay_t<decltype(value)>>(draw.Number()); });

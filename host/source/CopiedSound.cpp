@@ -97,9 +97,7 @@ public:
             result = av_bsf_init(context_.get());
         }
         av::CheckMemory(result);
-        av::Packet packet(av_packet_clone(&first));
-        if (!packet)
-            throw std::bad_alloc();
+        const av::Packet packet = av::CopyOf(first);
         size_t size = 0;
         const uint8_t* told = nullptr;
         if (result >= 0 && Filter(*packet))
@@ -143,12 +141,8 @@ CopiedSound::CopiedSound(const MovieReader& reader, const AVStream& stream, Demu
       demuxer_(demuxer),
       stream_(stream.index),
       timeBase_(stream.time_base),
-      parameters_(avcodec_parameters_alloc()),
-      sampleBytes_(SampleBytes(*stream.codecpar)) {
-    if (!parameters_)
-        throw std::bad_alloc();
-    av::CheckMemory(avcodec_parameters_copy(parameters_.get(), stream.codecpar));
-}
+      parameters_(av::CopyOf(*stream.codecpar)),
+      sampleBytes_(SampleBytes(*stream.codecpar)) {}
 
 CopiedSound::~CopiedSound() = default;
 
@@ -211,9 +205,7 @@ bool CopiedSound::Cut(Held& first, int64_t until, bool closing) {
     }
     if (!closing || most <= 0)
         return false;
-    current_ = {av::Packet(av_packet_clone(first.packet.get())), first.begin, most};
-    if (!current_.packet)
-        throw std::bad_alloc();
+    current_ = {av::CopyOf(*first.packet), first.begin, most};
     const auto bytes = static_cast<int>(most * sampleBytes_);
     current_.packet->size = bytes;
     first.packet->data += bytes;

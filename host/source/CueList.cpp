@@ -4,13 +4,11 @@
 #include "host/source/PacketTime.h"
 #include "host/source/SourceError.h"
 #include "host/source/StreamChoice.h"
-#include "host/source/StreamDecoder.h"
 #include "host/source/SubtitleFile.h"
 
 #include <algorithm>
 #include <fmt/format.h>
 #include <memory>
-#include <new>
 #include <utility>
 
 namespace movieconv {
@@ -39,7 +37,7 @@ void ReadStream(CueList& list, const Source& source, const BurnWish& wish, bool 
         throw TrackError(fmt::format("the subtitles {} are not there any more", stream));
     const AVStream& found = *context->streams[stream];
     CheckDecodable(*found.codecpar, wish);
-    list.parameters = CopyOf(*found.codecpar);
+    list.parameters = av::CopyOf(*found.codecpar);
     reader.Select({stream});
     if (wish.begin > kFarthest) {
         const int64_t from = reader.Start() + wish.begin - kFarthest;
@@ -71,7 +69,7 @@ void ReadFile(CueList& list, const Source& source, const BurnWish& wish) {
         SubtitleFile file(wish.what, wish.charset, source.Reader().Interruptible());
         const AVStream& stream = file.Stream();
         CheckDecodable(*stream.codecpar, wish);
-        list.parameters = CopyOf(*stream.codecpar);
+        list.parameters = av::CopyOf(*stream.codecpar);
         while (av::Packet packet = file.Take().packet) {
             const auto ticks = [&](int64_t stamp) {
                 return av_rescale_q(stamp, stream.time_base, {1, kTicksPerSecond});
@@ -96,9 +94,7 @@ bool NamesStream(const BurnWish& wish) {
 }
 
 av::CodecContext CueList::OpenDecoder(AVRational timeBase) const {
-    av::CodecContext decoder(avcodec_alloc_context3(avcodec_find_decoder(parameters->codec_id)));
-    if (!decoder)
-        throw std::bad_alloc();
+    av::CodecContext decoder = av::NewCodecContext(avcodec_find_decoder(parameters->codec_id));
     av::CheckMemory(avcodec_parameters_to_context(decoder.get(), parameters.get()));
     decoder->pkt_timebase = timeBase;
     const int result = avcodec_open2(decoder.get(), decoder->codec, nullptr);

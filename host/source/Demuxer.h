@@ -9,13 +9,12 @@
 
 #include "host/source/ClockRepair.h"
 #include "host/source/Failures.h"
+#include "host/source/KeySeeker.h"
+#include "host/source/PacketQueues.h"
 #include "host/source/Source.h"
 #include "thread/Stall.h"
 
-#include <compare>
 #include <condition_variable>
-#include <deque>
-#include <map>
 #include <mutex>
 #include <optional>
 #include <thread>
@@ -79,51 +78,30 @@ public:
     int ClockJumps() const;
 
 private:
-    struct Queue {
-        std::deque<av::Packet> packets;
-        std::size_t bytes = 0;
-        std::optional<int64_t> end;      // in media time, of what was read
-        int64_t silentUntil = INT64_MIN; // told to the taker
-        bool mayBeSilent = false;
-        int64_t wanted = INT64_MIN; // up to there its taker waits for packets
-    };
-    struct Taker {
-        int stream;
-        bool beside = false;
-
-        auto operator<=>(const Taker&) const = default; // NOLINT(modernize-use-nullptr): it sees a 0
-    };
+    using Queue = PacketQueues::Queue;
 
     void Start();
     void Run();
     template <class Known>
     av::Packet Take(std::unique_lock<std::mutex>& lock, Queue& queue, Known known);
-    std::optional<int64_t> Silence(const Queue& queue) const;
-    int64_t Reached() const;
-    bool IsAwaited(const Queue& queue) const;
-    void Enqueue(Queue& queue, av::Packet packet, std::optional<int64_t> end);
-    std::size_t Held() const;
+    template <class Reached>
+    void AwaitBeside(std::unique_lock<std::mutex>& lock, Queue& queue, int64_t until, Reached reached);
     bool AwaitDemand();
     bool ReadOne();
-    bool SeeksAstray() const;
-    bool SeekBefore(double seconds);
-    bool KeyPictureAtOrBefore(int64_t mediaTime);
-    bool Holds(std::size_t packets, std::size_t bytes) const;
     void RepairClock(AVPacket& packet);
     std::optional<int64_t> EndOf(const AVPacket& packet) const;
 
     Source& source_;
     Failures& failures_;
     const std::vector<int> witnesses_; // read for the clock alone, unless they are taken too
+    KeySeeker seeker_;
     double soughtSeconds_ = -1;
     bool soughtWell_ = false;
     bool staysAtStart_ = false;
-    bool moved_ = false;     // away from the start
-    bool awaitsKey_ = false; // picture, to which it was sought
 
     mutable std::mutex mutex_;
     std::condition_variable changed_;
-    std::map<Taker, Queue> queues_;
+    PacketQueues queues_;
     bool started_ = false;
     bool stopping_ = false;
     bool ended_ = false;

@@ -35,7 +35,7 @@ PictureDecoder::PictureDecoder(const Source& source, Demuxer& demuxer, Failures&
       failures_(failures),
       stream_(source.PictureStream()->index),
       timeBase_(source.PictureStream()->time_base),
-      parameters_(CopyOf(*source.PictureStream()->codecpar)),
+      parameters_(av::CopyOf(*source.PictureStream()->codecpar)),
       threads_(BitsPerPixel(source)),
       decoder_(std::make_unique<StreamDecoder>(*parameters_, timeBase_, threads_.Count())),
       filter_(*source.Info().pictures, choice),
@@ -125,7 +125,7 @@ void PictureDecoder::Run() {
     repaired_ = stamps_.Repaired();
     deinterlaced_ = filter_.Deinterlaced();
     leftInterlaced_ = filter_.LeftInterlaced();
-    damaged_ = damagedBefore_ + decoder_->Damaged();
+    damaged_ = unconverted_ + decoder_->Damaged();
     queue_.Finish();
 }
 
@@ -136,7 +136,7 @@ void PictureDecoder::DecodeAll() {
         lastStay_.Add(*packet);
         if (!decoder_->Decode(packet.get(), accept))
             return;
-        damaged_ = damagedBefore_ + decoder_->Damaged();
+        damaged_ = unconverted_ + decoder_->Damaged();
         if (!threads_.OnTrial())
             continue;
         if (const auto known = threads_.Consider(*packet); known && !UseMoreThreads(*known))
@@ -193,7 +193,7 @@ bool PictureDecoder::Deliver(StampRepair::Stamp stamp) {
     }
     av::Frame picture = converter_.Convert(*held_);
     if (!picture) {
-        ++damagedBefore_;
+        ++unconverted_;
         return true;
     }
     if (burner_ != nullptr)

@@ -102,7 +102,7 @@ private:
     int64_t skip_ = 0; // frames that a restarted decoder gives once more
     bool first_ = true;
     bool refused_ = false; // nobody takes pictures any more
-    int64_t damagedBefore_ = 0;
+    int64_t unconverted_ = 0;
 
     // Between the threads.
     BoundedQueue<Picture> queue_;

@@ -126,7 +126,7 @@ void ProbeLight(MovieReader& reader, SourceInfo& info) {
     if (!IsHdr(pictures) || (pictures.masteringDisplay && pictures.lightLevel) || !reader.IsSeekable())
         return;
     const AVStream* stream = reader.Context()->streams[pictures.index];
-    const av::CodecParameters parameters = CopyOf(*stream->codecpar);
+    const av::CodecParameters parameters = av::CopyOf(*stream->codecpar);
     StreamDecoder decoder(*parameters, stream->time_base, 1);
     const auto look = [&](const AVFrame& frame) {
         const auto sideData = [&](AVFrameSideDataType type) -> const void* {

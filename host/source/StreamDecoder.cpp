@@ -4,25 +4,13 @@
 
 namespace movieconv {
 
-av::CodecParameters CopyOf(const AVCodecParameters& parameters) {
-    av::CodecParameters copy(avcodec_parameters_alloc());
-    if (!copy)
-        throw std::bad_alloc();
-    av::CheckMemory(avcodec_parameters_copy(copy.get(), &parameters));
-    return copy;
-}
-
 StreamDecoder::StreamDecoder(const AVCodecParameters& parameters, AVRational timeBase, int threads)
-    : frame_(av::NewFrame()) {
-    const AVCodec* codec = avcodec_find_decoder(parameters.codec_id);
-    context_.reset(avcodec_alloc_context3(codec));
-    if (!context_)
-        throw std::bad_alloc();
+    : context_(av::NewCodecContext(avcodec_find_decoder(parameters.codec_id))), frame_(av::NewFrame()) {
     av::CheckMemory(avcodec_parameters_to_context(context_.get(), &parameters));
     context_->pkt_timebase = timeBase;
     context_->thread_count = threads;
     context_->thread_type = FF_THREAD_FRAME | FF_THREAD_SLICE;
-    const int result = avcodec_open2(context_.get(), codec, nullptr);
+    const int result = avcodec_open2(context_.get(), context_->codec, nullptr);
     av::CheckMemory(result);
     if (result < 0) {
         throw SourceError(std::string("cannot start the decoder ") + avcodec_get_name(parameters.codec_id) +

@@ -9,9 +9,6 @@
 
 namespace movieconv {
 
-/// Parameters that outlive their stream. Throws std::bad_alloc.
-av::CodecParameters CopyOf(const AVCodecParameters& parameters);
-
 class StreamDecoder {
 public:
     /// Takes a frame by moving its content out; false ends the decoding.

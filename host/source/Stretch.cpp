@@ -3,7 +3,6 @@
 #include "host/source/MediaTime.h"
 #include "host/source/PacketTime.h"
 #include "host/source/SourceError.h"
-#include "host/source/StreamDecoder.h"
 
 #include <algorithm>
 #include <cstddef>
@@ -19,7 +18,7 @@ Stretch ReadStretch(MovieReader& reader, int counted, int64_t mostBytes, int mos
     AVFormatContext* context = reader.Context();
     std::vector<av::CodecParameters> beginnings;
     for (unsigned i = 0; i < context->nb_streams; ++i)
-        beginnings.push_back(CopyOf(*context->streams[i]->codecpar));
+        beginnings.push_back(av::CopyOf(*context->streams[i]->codecpar));
     Stretch stretch;
     const av::Packet packet = av::NewPacket();
     while (stretch.bytes < mostBytes && stretch.packets < mostPackets &&

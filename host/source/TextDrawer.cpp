@@ -141,9 +141,7 @@ public:
 
 private:
     void Decode(const CueList::Cue& cue) {
-        const av::Packet packet(av_packet_clone(cue.packet.get()));
-        if (!packet)
-            throw std::bad_alloc();
+        const av::Packet packet = av::CopyOf(*cue.packet);
         packet->pts = packet->dts = 0;
         AVSubtitle decoded{};
         int got = 0;

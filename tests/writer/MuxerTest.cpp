@@ -55,7 +55,7 @@ class SoundFile {
 public:
     SoundFile(const char (&format)[5], AVCodecID codec)
         : muxer_(*writer::FindContainer(FourCC(format)), io_, false, true, extras_) {
-        const av::CodecParameters parameters(avcodec_parameters_alloc());
+        const av::CodecParameters parameters = av::NewParameters();
         parameters->codec_type = AVMEDIA_TYPE_AUDIO;
         parameters->codec_id = codec;
         parameters->format = AV_SAMPLE_FMT_S16;
