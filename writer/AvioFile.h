@@ -46,7 +46,7 @@ private:
     const std::shared_ptr<ByteFile> file_;
     const Tap tap_;
     av::Io io_;
-    int error_ = 0;
+    std::atomic<int> error_{0}; // may be asked on any thread
     int64_t position_ = 0;
     std::atomic<int64_t> size_{0};
 };

@@ -3,6 +3,7 @@
 #include "media/MediaRecords.h"
 #include "writer/PacketTracks.h"
 #include "writer/SoundStage.h"
+#include "writer/WriterFailure.h"
 
 #include <algorithm>
 #include <utility>
@@ -152,9 +153,12 @@ void BesideStage::Read(Track& track, const Step& step) {
                0;
     };
     WriterTrackItem item{};
-    while (!thread_.Cancelled() && next(item))
+    while (!thread_.Cancelled() && next(item)) {
+        if (track.plan->sound ? item.pSound == nullptr : item.pPacket == nullptr)
+            throw WriterFailure(kWriterErrorArgument, "The reader of a further track gave nothing.");
         if (!track.writer->Take(item, item.llTime - *begin_))
             return;
+    }
     if (!step.closing)
         track.writer->Reach(std::min(step.time, item.llTime) - *begin_);
 }

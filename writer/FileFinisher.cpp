@@ -58,12 +58,19 @@ void FileFinisher::FinishInPlace() {
                         plan_.bitExact, extras_, [this](double share) {
                             Progress(kDrainedShare + (kIndexedShare - kDrainedShare) * share);
                         });
+        isPlain_ = true;
+    } catch (const SyncFailure&) {
+        throw;
     } catch (...) {
         const WriterFailure failure = FailureOf(std::current_exception());
         if (failure.Kind() == kWriterErrorFinish || NeedsIndex(extras_))
             throw;
         WriteLog(kLogWarning, "Keeping the fragmented form of \"%s\": %s", target_.c_str(), failure.what());
     }
+    TellSizeOnDisk();
+}
+
+void FileFinisher::TellSizeOnDisk() {
     const int64_t size = part_.File()->Seek(0, SEEK_END);
     record_.Update([size](WriterStatus& status) { status.llBytesWritten = size; });
 }
@@ -86,6 +93,10 @@ void FileFinisher::Publish() {
 void FileFinisher::Abandon() {
     if (record_.Options().bRemovePartial != 0) {
         part_.Remove();
+        return;
+    }
+    if (isPlain_) { // there is nothing to cut off
+        TellSizeOnDisk();
         return;
     }
     // Asked for an end without what describes a stream, the multiplexer refuses, and leaks.

@@ -33,6 +33,7 @@ private:
     void FinishInPlace();
     void Publish();
     void TellLengths();
+    void TellSizeOnDisk();
     void Progress(double share);
 
     PartFile& part_;
@@ -42,6 +43,7 @@ private:
     FileSystem& files_;
     Extras extras_;
     double toldShare_ = 0;
+    bool isPlain_ = false; // has the form of a finished file of the MP4 family
 };
 
 } // namespace writer

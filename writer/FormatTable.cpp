@@ -184,7 +184,7 @@ constexpr std::array kContainers{
     Container{kGif, "GIF (animated)", "gif", "gif", kStreamed, nullptr, 0, kNoTags, kNoFlags, nullptr, nullptr,
               0, {kGif}, {}},
     Container{FourCC("M4A "), "MPEG-4 audio", "m4a,m4b", "ipod", kFragmented, nullptr,
-              kTags | kChapters | kCover | kTracks | kLanguages, kMp4Tags, kNoFlags, kMp4Subtitles, "aac,alac,ac3,eac3", kLanguageTags,
+              kTags | kChapters | kCover | kTracks | kLanguages, kMp4Tags, kNoFlags, kMp4Subtitles, "aac,alac,ac3", kLanguageTags,
               {}, {kAac, kAc3, kAlac}},
     Container{FourCC("MP3 "), "MP3", "mp3", "mp3", kStreamed, nullptr,
               kTags | kCover | kCoverText, kAnyTags, kNoFlags, nullptr, "mp3", 0, {}, {kMp3}},
@@ -210,7 +210,6 @@ constexpr std::array kCarriages{
     Carriage{FourCC("M4A "), kAc3, 0, true},
     Carriage{FourCC("MP4 "), kEac3, 0, true},
     Carriage{FourCC("MOV "), kEac3, 0, true},
-    Carriage{FourCC("M4A "), kEac3, 0, true},
     Carriage{FourCC("FLV "), kMp3, 0, false, kFlashRates.data()},
     Carriage{FourCC("MP4 "), kMp3, 0, false, kStandardMp3Rates.data()},
     // A frame of more than 768 bytes a channel counts as two there, and encoders go above their rate.

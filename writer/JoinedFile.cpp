@@ -176,6 +176,10 @@ void JoinedFile::AddStreams() {
     MuxedStream shown = pictures_->Description(*plan_.container, extras.pictures);
     shown.light = plan_.pictures->settings.light ? &*plan_.pictures->settings.light : nullptr;
     add(shown);
+    record_->Update([&](WriterStatus& status) {
+        status.nWidth = shown.parameters->width;
+        status.nHeight = shown.parameters->height;
+    });
     std::vector<const TrackLabel*> labels;
     if (plan_.sound)
         labels.push_back(&extras.sound);

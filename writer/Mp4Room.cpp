@@ -55,7 +55,7 @@ void WriteAt(ByteFile& file, int64_t position, const std::vector<uint8_t>& bytes
 
 void Sync(ByteFile& file) {
     if (const int64_t result = file.Sync(); result < 0)
-        throw Failure(result);
+        throw SyncFailure(static_cast<int>(-result));
 }
 
 /// A file as it will be when one byte of it has become 0.

@@ -13,12 +13,20 @@
 
 #include "writer/FileSystem.h"
 #include "writer/Mp4Index.h"
+#include "writer/WriterFailure.h"
 
 #include <atomic>
 #include <cstdint>
 #include <functional>
 
 namespace writer {
+
+/// The data did not reach the disk. The system tells that once: a later attempt succeeds with it missing.
+class SyncFailure final : public WriterFailure {
+public:
+    explicit SyncFailure(int error)
+        : WriterFailure(SystemFailure(kWriterErrorFinish, error, "Syncing the data failed")) {}
+};
 
 /// The size of a room in which that many bytes of index, and texts, fit.
 int64_t RoomFor(int64_t bytes);
@@ -39,7 +47,8 @@ public:
 
     /// Makes the plain file. `index` gives the index with its texts at a position, `textSize` or fewer bytes
     /// of them; `check` is shown the file as it will be, and throws when something is missing there. Where
-    /// something fails, the file stays the growing one, and WriterFailure is thrown.
+    /// something fails, the file stays the growing one, and WriterFailure is thrown: SyncFailure when nothing
+    /// that was written is certain to be on the disk.
     void Finish(ByteFile& file, const std::function<Mp4Index::Result(int64_t place)>& index, int64_t textSize,
                 const std::function<void(ByteFile&)>& check) const;
 

@@ -182,9 +182,10 @@ void Muxer::Write(AVPacket& packet, int stream) {
     av_packet_rescale_ts(packet_.get(), state.unit, out->time_base);
     packet_->pts += state.delay;
     packet_->dts += state.delay;
-    // A coarse unit can make two times equal.
-    if (state.lastDts != AV_NOPTS_VALUE && packet_->dts <= state.lastDts) {
-        packet_->dts = state.lastDts + 1;
+    // A coarse unit can make two times equal. Many texts may be shown at one time.
+    const int64_t step = state.sparse && extras_.IsMatroska() ? 0 : 1;
+    if (state.lastDts != AV_NOPTS_VALUE && packet_->dts < state.lastDts + step) {
+        packet_->dts = state.lastDts + step;
         packet_->pts = std::max(packet_->pts, packet_->dts);
     }
     state.lastDts = packet_->dts;

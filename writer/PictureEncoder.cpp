@@ -153,9 +153,7 @@ void PictureEncoder::Encode(AVFrame& frame, int64_t tick, int64_t stay, const Pa
     frame.quality = context_->global_quality;
     if (!holds_)
         return Send(&frame, take);
-    av::Frame next(av_frame_clone(&frame));
-    if (!next)
-        throw std::bad_alloc();
+    av::Frame next = av::CopyOf(frame);
     SendHeld(take);
     held_ = std::move(next);
 }

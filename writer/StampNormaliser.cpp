@@ -52,13 +52,14 @@ void StampNormaliser::AddSound(int64_t stamp, int64_t bytes, int64_t bytesPerSec
     if (!silence)
         reference_ = Reference{stamp, SoundLength()};
     segmentBytes_ += bytes;
-    if (!last_ && SoundLength() > kLongestWait)
+    if (!soundStart_ && SoundLength() - lengthAtLast_ > kLongestWait)
         Finish();
 }
 
 int64_t StampNormaliser::AddPicture(int64_t stamp) {
     const int64_t time = last_ ? PlaceNext(stamp, *last_) : PlaceFirst(stamp);
     last_ = Picture{stamp, time};
+    lengthAtLast_ = SoundLength();
     return time;
 }
 

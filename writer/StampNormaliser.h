@@ -65,6 +65,7 @@ private:
     std::optional<Reference> reference_;
     std::optional<int64_t> soundStart_;
     std::optional<Picture> last_;
+    int64_t lengthAtLast_ = 0; ///< Of the sound, at the last picture.
     int64_t repairs_ = 0;
 };
 

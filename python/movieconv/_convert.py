@@ -95,8 +95,9 @@ class Conversion:
 
     def stop(self) -> None:
         """Ends it; the output is finished with what was converted. Iterating ends then, without an error."""
-        self._stopped = True
-        self._signal(signal.SIGTERM)
+        if not self._stopped:  # a second signal would end it at once
+            self._stopped = True
+            self._signal(signal.SIGTERM)
         self.resume()
 
     def _signal(self, number: int) -> None:
@@ -109,6 +110,9 @@ class Conversion:
     def __exit__(self, *_error: Any) -> None:
         if self._process.poll() is None:
             self.stop()
+            assert self._process.stdout is not None
+            for _ in self._process.stdout:  # it waits for a reader before it ends
+                pass
             self._process.wait()
         if self._process.stdout is not None:
             self._process.stdout.close()

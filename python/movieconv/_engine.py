@@ -5,6 +5,7 @@ from __future__ import annotations
 import ctypes as c
 import enum
 import os
+import threading
 from dataclasses import dataclass
 from typing import Any, Callable, Iterable, Optional, Tuple
 
@@ -82,6 +83,7 @@ class LogLevel(enum.IntEnum):
 
 
 _log_function: Any = None  # what the library calls must stay alive
+_log_lock = threading.Lock()  # that the last one set is the one kept
 
 
 def set_log_function(function: Optional[Callable[[LogLevel, str], None]]) -> None:
@@ -94,9 +96,10 @@ def set_log_function(function: Optional[Callable[[LogLevel, str], None]]) -> Non
             function(LogLevel(level), line.decode("utf-8", "replace"))
 
     callback = lib.LogFunction(take)
-    if lib.library().MCSetLogCallback(callback, None) == 0:
-        raise MemoryError
-    _log_function = callback
+    with _log_lock:
+        if lib.library().MCSetLogCallback(callback, None) == 0:
+            raise MemoryError
+        _log_function = callback
 
 
 def version() -> Tuple[int, int, int]:

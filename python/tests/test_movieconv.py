@@ -126,6 +126,24 @@ def test_pauses_and_stops_a_conversion(tmp_path):
     assert int(streams(tmp_path / "out.mkv")["video"]) < 5000 if (tmp_path / "out.mkv").exists() else True
 
 
+def test_leaving_a_conversion_signals_once_and_reads_what_it_still_tells(tmp_path, monkeypatch):
+    talkative = tmp_path / "movieconv"  # ends when all of its news were read
+    talkative.write_text("#!/bin/sh\n"
+                         "trap 'printf T >>\"$0.signals\"; yes {} | head -c 200000; exit 6' TERM\n"
+                         "echo '{\"event\": \"warning\", \"text\": \"begun\"}'\n"
+                         "echo '{\"event\": \"progress\", \"phase\": \"converting\", \"percent\": 1, "
+                         "\"position_s\": 1, \"speed\": 1, \"left_s\": 1, \"bytes\": 1}'\n"
+                         "while :; do sleep 0.05; done\n")
+    talkative.chmod(0o755)
+    monkeypatch.setenv("MOVIECONV_PROGRAM", str(talkative))
+    with movieconv.convert("in.mkv", "out.mkv") as conversion:
+        next(iter(conversion))
+        conversion.stop()
+        conversion.stop()
+    assert conversion.warnings == ["begun"] and conversion._process.returncode == 6
+    assert (tmp_path / "movieconv.signals").read_text() == "T"
+
+
 def test_conversions_at_once_know_nothing_of_each_other(tmp_path):
     results = {}
 

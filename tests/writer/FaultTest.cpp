@@ -28,7 +28,7 @@ struct Faults {
     /// writes depends on the threads, so none at the end has a number.
     bool (*failsAt)(const uint8_t* data, int64_t size) = nullptr;
     int writeError = ENOSPC;
-    int syncError = 0;
+    int syncError = 0; ///< Once: a system that has told it takes the data for written.
     int renameError = 0;
     std::atomic<int> writes{0};
 };
@@ -54,7 +54,10 @@ public:
     int64_t Read(uint8_t* data, int64_t size) override { return file_->Read(data, size); }
     int64_t Seek(int64_t offset, int whence) override { return file_->Seek(offset, whence); }
     int64_t Truncate(int64_t size) override { return file_->Truncate(size); }
-    int64_t Sync() override { return faults_.syncError != 0 ? -faults_.syncError : file_->Sync(); }
+    int64_t Sync() override {
+        const int error = std::exchange(faults_.syncError, 0);
+        return error != 0 ? -error : file_->Sync();
+    }
 
 private:
     std::unique_ptr<writer::ByteFile> file_;
@@ -106,7 +109,9 @@ protected:
         created_ = false;
         faults_.writes = 0;
         FaultyFiles files(faults_);
-        const VideoFormat video = movie_.Video();
+        VideoFormat video = movie_.Video();
+        if (lengthUnknown_)
+            video.dDuration = 0;
         const AudioFormat audio = movie_.Audio();
         const auto record = set.Open(path_);
         try {
@@ -130,6 +135,7 @@ protected:
     std::vector<int> events_;
     bool created_ = false;
     bool withChapter_ = false;
+    bool lengthUnknown_ = false;
     int asked_ = 0; ///< For more room.
 };
 
@@ -258,14 +264,29 @@ INSTANTIATE_TEST_SUITE_P(
     [](const auto& info) { return info.param.name; });
 
 TEST_F(Fault, SyncAndRenameKeepTheDataUnderItsTemporaryName) {
-    for (int Faults::*where : {&Faults::syncError, &Faults::renameError}) {
+    const struct {
+        int Faults::*where;
+        int error;
+        int told;
+        bool lengthUnknown; // the index comes behind, for want of room
+    } cases[] = {{&Faults::syncError, EIO, kWriterErrorFinish, false},
+                 {&Faults::syncError, ENOSPC, kWriterErrorNoSpace, true},
+                 {&Faults::renameError, EIO, kWriterErrorFinish, false},
+                 {&Faults::renameError, EISDIR, kWriterErrorFinish, true}};
+    movie_.pictures = 900;
+    movie_.soundSeconds = 36;
+    for (const auto& test : cases) {
+        SCOPED_TRACE(&test - cases);
         faults_.syncError = faults_.renameError = 0;
-        faults_.*where = EIO;
+        faults_.*test.where = test.error;
+        lengthUnknown_ = test.lengthUnknown;
         const WriterStatus status = Run();
         EXPECT_EQ(status.nState, kWriterFileFailed);
-        EXPECT_EQ(status.nError, kWriterErrorFinish);
-        EXPECT_EQ(status.nSystemError, EIO);
-        EXPECT_EQ(ReadMovieFile(status.szTemporaryPath).pictures.size(), 100U);
+        EXPECT_EQ(status.nError, test.told);
+        EXPECT_EQ(status.nSystemError, test.error);
+        EXPECT_EQ(ReadMovieFile(status.szTemporaryPath).pictures.size(), 900U);
+        EXPECT_EQ(std::filesystem::file_size(status.szTemporaryPath),
+                  static_cast<std::uintmax_t>(status.llBytesWritten));
         EXPECT_FALSE(std::filesystem::exists(path_));
         EXPECT_EQ(folder_.Names().size(), 1U);
         std::filesystem::remove(status.szTemporaryPath);

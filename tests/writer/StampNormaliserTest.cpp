@@ -253,6 +253,10 @@ TEST(StampNormaliser, SoundAloneBeginsAtZero) {
     EXPECT_FALSE(waiting.SoundStart().has_value());
     waiting.AddSound(0, 10 * 176'400, 176'400, false);
     EXPECT_EQ(waiting.SoundStart(), 0);
+    StampNormaliser onePicture(400'000, true);
+    onePicture.AddPicture(-1);
+    onePicture.AddSound(0, 11 * 176'400, 176'400, false);
+    EXPECT_EQ(onePicture.SoundStart(), 0);
 }
 
 TEST(StampNormaliser, CountsSoundOfChangingByteRates) {
