@@ -95,7 +95,11 @@ inline CodecParameters NewParameters() {
     return parameters ? std::move(parameters) : throw std::bad_alloc();
 }
 
-/// One more reference to the same data. Throws std::bad_alloc.
+/// One more reference to the same data. Throw std::bad_alloc.
+inline Frame CopyOf(const AVFrame& frame) {
+    Frame copy(av_frame_clone(&frame));
+    return copy ? std::move(copy) : throw std::bad_alloc();
+}
 inline Packet CopyOf(const AVPacket& packet) {
     Packet copy(av_packet_clone(&packet));
     return copy ? std::move(copy) : throw std::bad_alloc();

@@ -2,6 +2,7 @@
 
 #include "host/convert/CarryTexts.h"
 #include "host/convert/CodecPlan.h"
+#include "host/convert/Failure.h"
 #include "host/convert/Formats.h"
 #include "host/convert/Timecode.h"
 #include "host/source/Languages.h"
@@ -13,6 +14,7 @@
 #include "writer/WriterStatus.h"
 
 #include <algorithm>
+#include <array>
 #include <cstddef>
 #include <fmt/format.h>
 #include <new>
@@ -47,6 +49,19 @@ std::string WhySubtitlesStay(const StreamInfo& stream, const FileFormatInfo& for
         return {};
     const bool matroskaCan = MWCarriesPackets(kMatroska, stream.codec.c_str()) != 0;
     return fmt::format("{} cannot hold them{}", ShortName(format), matroskaCan ? ", MKV can" : "");
+}
+
+/// Throws Failure for frames that MP4 and its like hold in another form: they join those of E-AC-3 that have
+/// fewer than six blocks of 256 samples.
+void RequireHoldable(const AVCodecParameters& sound, const FileFormatInfo& format) {
+    constexpr int kWholeFrame = 6 * 256;
+    constexpr std::array kJoining{FourCC("MP4 "), FourCC("MOV ")};
+    const bool isPart =
+        sound.codec_id == AV_CODEC_ID_EAC3 && sound.frame_size > 0 && sound.frame_size < kWholeFrame;
+    if (isPart && std::find(kJoining.begin(), kJoining.end(), format.fccFormat) != kJoining.end())
+        throw Failure(Category::kRequest,
+                      fmt::format("{} cannot hold short frames of \"{}\" sound as it is; MKV can",
+                                  ShortName(format), avcodec_get_name(sound.codec_id)));
 }
 
 /// What an output loses of a file of subtitles that holds this stream.
@@ -89,7 +104,9 @@ public:
         track.nBitsPerSample = stream.sound->bitsPerSample;
         track.nBitrate = plan.rate.value_or(0);
         track.nChannelMask = stream.sound->speakers;
-        tracks_.push_back({track, &movie_.ReadSoundBeside(stream.index), stream});
+        BesideSound& source =
+            OpenedBeside([&]() -> BesideSound& { return movie_.ReadSoundBeside(stream.index); });
+        tracks_.push_back({track, &source, stream});
     }
 
     /// Returns what of it is lost.
@@ -112,16 +129,21 @@ public:
     void AddPackets(const StreamInfo& stream) {
         WriterTrack track{};
         track.pParameters = movie_.StreamOf(stream.index).codecpar;
-        tracks_.push_back({track, &movie_.ReadPacketsBeside(stream.index), stream});
+        BesidePackets& source =
+            OpenedBeside([&]() -> BesidePackets& { return movie_.ReadPacketsBeside(stream.index); });
+        tracks_.push_back({track, &source, stream});
     }
 
     /// Hands them to the writer: only now, since what is copied is described by its first packets.
     void Finish(Carried& carried) {
         int number = kWriterTrackFurther;
         for (Track& each : tracks_) {
-            if (each.copied != nullptr)
-                each.track.pParameters = &OpenedBeside(
+            if (each.copied != nullptr) {
+                const AVCodecParameters& described = OpenedBeside(
                     [&]() -> const AVCodecParameters& { return movie_.DescribeCopied(*each.copied); });
+                RequireHoldable(described, format_);
+                each.track.pParameters = &described;
+            }
             if (each.stream.kind == StreamKind::kSubtitles)
                 carried.subtitles.push_back({number, each.stream});
             each.track.pfnNext = TakeNext;

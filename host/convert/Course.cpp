@@ -8,6 +8,7 @@
 #include "host/convert/SizePlan.h"
 #include "host/convert/SoundLoss.h"
 #include "host/convert/Timecode.h"
+#include "host/source/CropDetection.h"
 #include "host/source/MediaTime.h"
 #include "text/FileNames.h"
 #include "text/Path.h"
@@ -39,8 +40,11 @@ bool HasShrunk(const SourceInfo& source) {
     return !unknown && static_cast<int64_t>(bytes) < source.bytes;
 }
 
-std::string TellCrop(const PictureStreamInfo& pictures) {
+std::string TellCrop(const SourceInfo& source) {
+    const PictureStreamInfo& pictures = *source.pictures;
     const Crop& crop = pictures.crop;
+    if (!CanBeLookedAtBefore(source.path))
+        return "black borders cannot be looked for in a pipe";
     if (crop.CutsNothing())
         return "no black borders were found";
     return fmt::format("the pictures are cropped to {}x{}: {} above, {} below, {} left, {} right",
@@ -91,7 +95,7 @@ void Course::Prepare() {
     if (request_.maxSize)
         observer_.Warned({Warning::Kind::kChosen, TellSize(request_)});
     if (!request_.piece && request_.detectCrop && movie_.Info().pictures)
-        observer_.Warned({Warning::Kind::kChosen, TellCrop(*movie_.Info().pictures)});
+        observer_.Warned({Warning::Kind::kChosen, TellCrop(movie_.Info())});
     if (!request_.piece && (lengthKnown || request_.length)) {
         sizeIsKnown_ = HasRates(request_, ChooseFormat(request_), movie_.Info());
         if (sizeIsKnown_)

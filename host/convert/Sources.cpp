@@ -30,7 +30,7 @@ SourceChoice ChoiceOf(const Request& request) {
 SourceChoice CroppedChoiceOf(const Request& request, const std::shared_ptr<Interruption>& interruption) {
     SourceChoice choice = ChoiceOf(request);
     choice.crop = request.crop;
-    if (request.detectCrop && choice.pictures) {
+    if (request.detectCrop && choice.pictures && CanBeLookedAtBefore(request.input)) {
         Source source(request.input, {.playlists = choice.playlists}, interruption);
         choice.crop = FindBorders(source).value_or(Crop{});
     }
@@ -88,7 +88,9 @@ Movie OpenMovie(const Request& request, std::shared_ptr<Interruption> interrupti
 }
 
 SourceInfo LookAtSource(const Request& request) {
-    return Opened([&] { return Source(request.input, CroppedChoiceOf(request, nullptr)).Info(); });
+    const auto interruption = std::make_shared<Interruption>();
+    return Opened(
+        [&] { return Source(request.input, CroppedChoiceOf(request, interruption), interruption).Info(); });
 }
 
 SourceInfo AsAskedFor(SourceInfo source, const Request& request) {

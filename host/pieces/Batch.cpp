@@ -226,7 +226,8 @@ std::optional<Crew::Assignment> Batch::Assign(const Movie& movie) {
 }
 
 /// Of a file that was found in a folder; tells why not.
-bool Batch::IsMovie(const Request& request) {
+bool Batch::IsMovie(Request request) {
+    request.detectCrop = false; // which takes long and does not matter here
     try {
         LookAtSource(request);
         return true;

@@ -49,7 +49,7 @@ private:
     void NoteSource(const std::string& path);
     std::string OutputFor(const std::string& input, const std::string& extension) const;
     std::optional<Assignment> Assign(const Movie& movie);
-    bool IsMovie(const Request& request);
+    bool IsMovie(Request request);
     void Fail(const std::string& input, const Failure& failure);
     Verdict Conclude();
 

@@ -68,6 +68,11 @@ public:
                 Demuxer& demuxer, const BesideBounds& bounds, Failures& failures);
 
     const AudioFormat& Format() const { return decoder_.Format(); }
+    int Stream() const { return stream_; }
+
+    /// As PcmDecoder's. Once the conversion has ended.
+    int64_t Damaged() const { return decoder_.Damaged(); }
+    int Corrections() const { return decoder_.Corrections(); }
 
 private:
     struct Stretch {

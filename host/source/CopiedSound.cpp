@@ -1,5 +1,6 @@
 #include "host/source/CopiedSound.h"
 
+#include "host/source/CodedSound.h"
 #include "host/source/MediaTime.h"
 #include "host/source/SourceError.h"
 
@@ -10,75 +11,11 @@ extern "C" {
 }
 
 #include <algorithm>
-#include <array>
 #include <cstring>
 #include <new>
 #include <utility>
 
 namespace movieconv {
-namespace {
-
-/// Samples at 48 kHz in a packet of Opus, as its first bytes tell.
-int64_t OpusSamples(const AVPacket& packet) {
-    if (packet.size < 1)
-        return 0;
-    static constexpr std::array kSilk{480, 960, 1920, 2880};
-    static constexpr std::array kHybrid{480, 960};
-    static constexpr std::array kCelt{120, 240, 480, 960};
-    const unsigned config = packet.data[0] >> 3;
-    const int frame = config < 12   ? kSilk.at(config & 3U)
-                      : config < 16 ? kHybrid.at(config & 1U)
-                                    : kCelt.at(config & 3U);
-    const unsigned code = packet.data[0] & 3U;
-    const int many = packet.size > 1 ? packet.data[1] & 0x3F : 0;
-    return int64_t{frame} * (code == 0 ? 1 : code == 3 ? many : 2);
-}
-
-/// A FLAC header tells length and digest of all sound; of a part they are not known.
-void ForgetWhole(AVCodecParameters& parameters) {
-    constexpr int kHeaderSize = 34;
-    constexpr int kLength = 13; // its lower half, and four bytes behind
-    constexpr int kDigest = 18;
-    if (parameters.codec_id != AV_CODEC_ID_FLAC || parameters.extradata_size < kHeaderSize)
-        return;
-    parameters.extradata[kLength] &= 0xF0;
-    std::fill(parameters.extradata + kLength + 1, parameters.extradata + kDigest, uint8_t{0});
-    std::fill(parameters.extradata + kDigest, parameters.extradata + kHeaderSize, uint8_t{0});
-}
-
-bool HasAdtsHeader(const AVPacket& packet) {
-    return packet.size > 7 && packet.data[0] == 0xFF && (packet.data[1] & 0xF6) == 0xF0;
-}
-
-/// What all headers of one form of AAC have in common.
-int FormOf(const AVPacket& packet) {
-    constexpr int kPrivateBit = 0x200;
-    return AV_RB16(packet.data + 2) & 0xFFC0 & ~kPrivateBit; // kind, rate and channels
-}
-
-bool DescribesAnew(const AVPacket& packet, const AVCodecParameters& parameters) {
-    size_t size = 0;
-    const uint8_t* told = av_packet_get_side_data(&packet, AV_PKT_DATA_NEW_EXTRADATA, &size);
-    return told != nullptr && (size != static_cast<size_t>(parameters.extradata_size) ||
-                               std::memcmp(told, parameters.extradata, size) != 0);
-}
-
-/// Whether it is the rest of a frame whose start is missing, as at the start of a recording that was cut.
-bool IsTail(const AVPacket& packet, AVCodecID codec) {
-    if (codec != AV_CODEC_ID_AC3 && codec != AV_CODEC_ID_EAC3)
-        return false;
-    const int word = packet.size >= 2 ? AV_RB16(packet.data) : 0;
-    return word != 0x0B77 && word != 0x770B;
-}
-
-int64_t SampleBytes(const AVCodecParameters& parameters) {
-    const bool isPcm =
-        parameters.codec_id >= AV_CODEC_ID_FIRST_AUDIO && parameters.codec_id < AV_CODEC_ID_ADPCM_IMA_QT;
-    const int bits = av_get_exact_bits_per_sample(parameters.codec_id);
-    return isPcm && bits >= 8 ? int64_t{bits} / 8 * parameters.ch_layout.nb_channels : 0;
-}
-
-} // namespace
 
 /// Takes the headers off AAC from broadcasts, which carry in each packet what others tell once.
 class CopiedSound::Deframer {
@@ -89,7 +26,7 @@ public:
         const AVBitStreamFilter* filter = av_bsf_get_by_name("aac_adtstoasc");
         int result = filter == nullptr ? AVERROR_BSF_NOT_FOUND : av_bsf_alloc(filter, &context);
         context_.reset(context);
-        form_ = FormOf(first);
+        form_ = AdtsForm(first);
         if (result >= 0)
             result = avcodec_parameters_copy(context_->par_in, &parameters);
         if (result >= 0) {
@@ -111,7 +48,7 @@ public:
         parameters.extradata_size = static_cast<int>(size);
     }
 
-    bool HasOtherForm(const AVPacket& packet) const { return FormOf(packet) != form_; }
+    bool HasOtherForm(const AVPacket& packet) const { return AdtsForm(packet) != form_; }
 
     /// False when the packet is damaged; its content is gone then.
     bool Filter(AVPacket& packet) {
@@ -154,6 +91,8 @@ const AVCodecParameters& CopiedSound::Describe() {
     if (first && parameters_->codec_id == AV_CODEC_ID_AAC && parameters_->extradata_size == 0 &&
         HasAdtsHeader(*first))
         deframer_ = std::make_unique<Deframer>(*parameters_, timeBase_, *first);
+    if (first && parameters_->codec_id == AV_CODEC_ID_EAC3)
+        parameters_->frame_size = Eac3Samples(*first);
     if (parameters_->codec_id == AV_CODEC_ID_VORBIS)
         vorbis_.reset(av_vorbis_parse_init(parameters_->extradata, parameters_->extradata_size));
     parameters_->initial_padding = first && bounds_.begin == 0 ? static_cast<int>(RunUp(*first)) : 0;
@@ -219,7 +158,8 @@ void CopiedSound::Hold(av::Packet packet) {
     if (packet->size <= 0 || (!timeline_ && IsTail(*packet, parameters_->codec_id)))
         return;
     const bool hasHeader = deframer_ && HasAdtsHeader(*packet);
-    if (hasHeader ? deframer_->HasOtherForm(*packet) : DescribesAnew(*packet, *parameters_))
+    if ((hasHeader ? deframer_->HasOtherForm(*packet) : DescribesAnew(*packet, *parameters_)) ||
+        HasOtherRate(*packet))
         throw SourceError("its sound changes its form there and cannot be copied on; convert it instead");
     if (hasHeader && !deframer_->Filter(*packet))
         return;
@@ -232,6 +172,14 @@ void CopiedSound::Hold(av::Packet packet) {
         doubted_ = std::move(held);
     else
         Settle(std::move(held), std::nullopt);
+}
+
+/// Than the packets before. What else may change in frames that tell their form themselves, such as the
+/// number of channels, a copy keeps.
+bool CopiedSound::HasOtherRate(const AVPacket& packet) {
+    const std::optional<int> told = RateTold(packet, parameters_->codec_id);
+    rate_ = rate_ ? rate_ : told;
+    return told && told != rate_;
 }
 
 void CopiedSound::SettleDoubted(std::optional<int64_t> witness) {

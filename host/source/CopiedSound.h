@@ -39,6 +39,7 @@ private:
     bool Find(int64_t until, bool closing, Item& item) override;
     bool Cut(Held& first, int64_t until, bool closing);
     void Hold(av::Packet packet);
+    bool HasOtherRate(const AVPacket& packet);
     void SettleDoubted(std::optional<int64_t> witness);
     void Settle(Held held, std::optional<int64_t> witness);
     bool Place(Held& held, std::optional<int64_t> witness);
@@ -59,6 +60,7 @@ private:
         void operator()(AVVorbisParseContext* parser) const;
     };
     std::unique_ptr<AVVorbisParseContext, VorbisParserFree> vorbis_;
+    std::optional<int> rate_; ///< As the packets tell it.
     std::optional<SoundTimeline> timeline_;
     int64_t origin_ = 0;          ///< Of the timeline, in samples from the start of the source.
     std::optional<Held> doubted_; ///< Waits for a witness.

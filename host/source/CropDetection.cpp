@@ -7,6 +7,8 @@
 #include <algorithm>
 #include <cmath>
 #include <cstdlib>
+#include <filesystem>
+#include <system_error>
 #include <utility>
 
 extern "C" {
@@ -75,6 +77,11 @@ Crop Upright(Crop crop, const PictureStreamInfo& pictures) {
 }
 
 } // namespace
+
+bool CanBeLookedAtBefore(const std::string& path) {
+    std::error_code unknown;
+    return std::filesystem::is_regular_file(path, unknown);
+}
 
 std::optional<Crop> FindBorders(Source& source) {
     if (!source.Info().pictures || !source.Reader().IsSeekable())

@@ -39,7 +39,8 @@ Demuxer::Demuxer(Source& source, Failures& failures)
     : source_(source),
       failures_(failures),
       witnesses_(WitnessesIn(source.Info(), *source.Reader().Context())),
-      seeker_(source) {
+      seeker_(source),
+      late_(source.Info().streams.size()) {
     source_.Reader().SelectBeside(witnesses_);
     if (const auto& pictures = source.Info().pictures)
         queues_.For({pictures->index});
@@ -166,6 +167,11 @@ int Demuxer::ClockJumps() const {
     return clock_.Jumps();
 }
 
+std::vector<LateStreams::Left> Demuxer::LeftOut() const {
+    const std::lock_guard lock(mutex_);
+    return late_.AllLeft();
+}
+
 std::size_t Demuxer::Bytes() const {
     const std::lock_guard lock(mutex_);
     return queues_.Bytes();
@@ -208,15 +214,30 @@ bool Demuxer::ReadOne() {
     failedReads_ = 0;
     if (seeker_.IsBeforeKey(*packet))
         return true;
+    GiveOut(std::move(packet));
+    return true;
+}
+
+/// To all who take its stream, or the one that this stream goes on with.
+void Demuxer::GiveOut(av::Packet packet) {
+    const AVFormatContext& context = *source_.Reader().Context();
+    const int stream = packet->stream_index;
+    if (queues_.IsTaken(stream))
+        late_.See(context, stream);
+    else if (const int replaced = late_.Replaced(context, stream);
+             replaced >= 0 && AreAlike(*context.streams[replaced], *context.streams[stream]))
+        packet->stream_index = replaced;
     RepairClock(*packet);
     {
         const std::optional<int64_t> end = EndOf(*packet);
+        const AVRational unit = context.streams[packet->stream_index]->time_base;
         const std::lock_guard lock(mutex_);
+        if (end && !queues_.IsTaken(packet->stream_index))
+            late_.Leave(context, stream, source_.Reader().MediaTime(StampOf(*packet), unit), *end);
         if (!queues_.Add(std::move(packet), end))
-            return true;
+            return;
     }
     changed_.notify_all();
-    return true;
 }
 
 std::optional<int64_t> Demuxer::EndOf(const AVPacket& packet) const {

@@ -10,6 +10,7 @@
 #include "host/source/ClockRepair.h"
 #include "host/source/Failures.h"
 #include "host/source/KeySeeker.h"
+#include "host/source/LateStreams.h"
 #include "host/source/PacketQueues.h"
 #include "host/source/Source.h"
 #include "thread/Stall.h"
@@ -77,6 +78,9 @@ public:
     /// Times that the source's clock jumped and was put right.
     int ClockJumps() const;
 
+    /// Streams of pictures and sound that came up while reading and were left out.
+    std::vector<LateStreams::Left> LeftOut() const;
+
 private:
     using Queue = PacketQueues::Queue;
 
@@ -88,6 +92,7 @@ private:
     void AwaitBeside(std::unique_lock<std::mutex>& lock, Queue& queue, int64_t until, Reached reached);
     bool AwaitDemand();
     bool ReadOne();
+    void GiveOut(av::Packet packet);
     void RepairClock(AVPacket& packet);
     std::optional<int64_t> EndOf(const AVPacket& packet) const;
 
@@ -106,6 +111,7 @@ private:
     bool stopping_ = false;
     bool ended_ = false;
     ClockRepair clock_; // changed by the reading thread alone
+    LateStreams late_;  // likewise
 
     int failedReads_ = 0;
     std::thread thread_;

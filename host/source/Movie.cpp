@@ -57,6 +57,7 @@ BesideSound& Movie::ReadSoundBeside(int stream) {
                                                failures_);
     BesideSound& made = *track;
     AddBeside(stream, std::move(track));
+    besideSound_.push_back(&made);
     return made;
 }
 
@@ -87,6 +88,7 @@ CopiedSound& Movie::CopySoundBeside(int stream) {
     auto track =
         std::make_unique<CopiedSound>(source_.Reader(), StreamOf(stream), demuxer_, bounds_, failures_);
     CopiedSound& made = *track;
+    soundIsCopied_ = soundIsCopied_ || (Info().sound && Info().sound->index == stream);
     AddBeside(stream, std::move(track));
     return made;
 }
@@ -151,7 +153,19 @@ std::optional<Shortfall> Movie::Missing() const {
         ends.pictures = reached(Info().pictures->index);
     if (sound_ && sound_->RanDry())
         ends.sound = reached(Info().sound->index);
-    return FindShortfall(Info().promise, ends);
+    const std::optional<Shortfall> found = FindShortfall(Info().promise, ends);
+    return found ? found : LateShortfall(ends);
+}
+
+/// What goes on only in streams that are not converted, since they came up late.
+std::optional<Shortfall> Movie::LateShortfall(const Reached& ends) const {
+    std::optional<Shortfall> found;
+    for (const LateStreams::Left& left : demuxer_.LeftOut()) {
+        Promise promise;
+        (left.kind == StreamKind::kPictures ? promise.pictures : promise.sound) = ToSeconds(left.end);
+        found = found ? found : FindShortfall(promise, ends);
+    }
+    return found;
 }
 
 std::vector<std::string> Movie::Complaints() const {
@@ -162,6 +176,11 @@ std::vector<std::string> Movie::Complaints() const {
     if (pictures_)
         for (std::string& loss : PictureLosses(*Info().pictures, choice_, *pictures_))
             texts.push_back(std::move(loss));
+    for (const LateStreams::Left& left : demuxer_.LeftOut())
+        texts.push_back(fmt::format(
+            "{} of {:.0f} s, which the source announces only at {:.0f} s, {} left out",
+            left.kind == StreamKind::kPictures ? "pictures" : "sound", ToSeconds(left.end - left.begin),
+            ToSeconds(left.begin), left.kind == StreamKind::kPictures ? "were" : "was"));
     if (const int jumps = demuxer_.ClockJumps(); jumps > 0) {
         texts.push_back(fmt::format("the source's clock jumped {}; the parts were joined",
                                     jumps == 1 ? "once" : fmt::format("{} times", jumps)));
@@ -177,6 +196,17 @@ std::vector<std::string> Movie::Complaints() const {
     if (sound_ && sound_->Corrections() > 0) {
         texts.push_back(
             fmt::format("the sound had {} gaps or overlaps, which were closed", sound_->Corrections()));
+    }
+    if (sound_ && !soundIsCopied_ && sound_->Channels() > Info().sound->channels)
+        texts.push_back(fmt::format("some of its sound has {} channels and got {}", sound_->Channels(),
+                                    Info().sound->channels));
+    for (const BesideSound* sound : besideSound_) {
+        if (sound->Damaged() > 0)
+            texts.push_back(fmt::format("{} damaged pieces of sound data were skipped in stream {}",
+                                        sound->Damaged(), sound->Stream()));
+        if (sound->Corrections() > 0)
+            texts.push_back(fmt::format("the sound of stream {} had {} gaps or overlaps, which were closed",
+                                        sound->Stream(), sound->Corrections()));
     }
     return texts;
 }

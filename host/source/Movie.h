@@ -105,6 +105,7 @@ public:
     std::vector<std::string> Complaints() const;
 
 private:
+    std::optional<Shortfall> LateShortfall(const Reached& ends) const;
     std::map<int, std::vector<av::Packet>>& EarlierCues();
     void AddBeside(int stream, std::unique_ptr<BesideTrack> track);
 
@@ -124,6 +125,8 @@ private:
     std::vector<int> besideStreams_;
     std::vector<std::unique_ptr<SubtitleFile>> subtitleFiles_;
     std::vector<std::unique_ptr<BesideTrack>> beside_;
+    std::vector<const BesideSound*> besideSound_; // of these
+    bool soundIsCopied_ = false;
 };
 
 } // namespace movieconv

@@ -42,6 +42,9 @@ public:
     /// One that there is.
     Queue& At(Taker taker) { return queues_.at(taker); }
 
+    /// Whether anybody takes a stream's packets.
+    bool IsTaken(int stream) const { return queues_.count({stream}) + queues_.count({stream, true}) > 0; }
+
     /// Gives a packet, which ends at `end`, to all who take its stream. False when nobody does. Throws
     /// std::bad_alloc.
     bool Add(av::Packet packet, std::optional<int64_t> end);

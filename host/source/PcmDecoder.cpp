@@ -50,7 +50,7 @@ void PcmDecoder::Begin(int64_t begin) {
 bool PcmDecoder::Decode(const AVPacket* packet) {
     const bool goesOn = decoder_.Decode(packet, [this](AVFrame& frame) { return Accept(frame); });
     if (begin_ > 0 && timeline_->Position() == 0)
-        damagedBefore_ = decoder_.Damaged();
+        damagedBefore_ = decoder_.Damaged() + unconverted_;
     if (packet == nullptr && resampler_)
         PushPlaced(std::nullopt, Resample(nullptr));
     return goesOn && packet != nullptr;
@@ -67,8 +67,12 @@ bool PcmDecoder::FillTo(int64_t time) {
 }
 
 bool PcmDecoder::Accept(const AVFrame& frame) {
-    if (frame.nb_samples <= 0 || !FitResampler(frame))
+    if (frame.nb_samples <= 0)
         return true;
+    if (!FitResampler(frame)) {
+        ++unconverted_;
+        return true;
+    }
     std::optional<int64_t> stamp;
     if (frame.best_effort_timestamp != AV_NOPTS_VALUE)
         stamp = reader_.MediaTime(frame.best_effort_timestamp, timeBase_);
@@ -86,6 +90,7 @@ bool PcmDecoder::FitResampler(const AVFrame& frame) {
         return true;
     if (resampler_)
         PushPlaced(std::nullopt, Resample(nullptr));
+    channels_ = std::max(channels_, frame.ch_layout.nb_channels);
     inputForm_->format = frame.format;
     inputForm_->sample_rate = frame.sample_rate;
     av_channel_layout_copy(&inputForm_->ch_layout, layout.Get());
@@ -114,6 +119,7 @@ PcmDecoder::Chunk PcmDecoder::Resample(const AVFrame* frame) {
     const auto** input = frame != nullptr ? const_cast<const uint8_t**>(frame->extended_data) : nullptr;
     const int samples = swr_convert(resampler_.get(), &output, room, input, inputSamples);
     av::CheckMemory(samples);
+    unconverted_ += samples < 0 ? 1 : 0;
     chunk.resize(static_cast<std::size_t>(std::max(samples, 0) * frameBytes_));
     return chunk;
 }

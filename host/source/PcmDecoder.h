@@ -42,7 +42,10 @@ public:
     bool FillTo(int64_t time);
 
     /// Packets and frames that were damaged, but for those before the begin, where a seek may land amid one.
-    int64_t Damaged() const { return decoder_.Damaged() - damagedBefore_; }
+    int64_t Damaged() const { return decoder_.Damaged() + unconverted_ - damagedBefore_; }
+
+    /// Of the frames that had most of them.
+    int Channels() const { return channels_; }
 
     /// Gaps filled and overlaps cut.
     int Corrections() const { return timeline_ ? timeline_->Corrections() : 0; }
@@ -71,6 +74,8 @@ private:
         Chunk chunk;
     };
     std::optional<Doubted> doubted_; // waits for a witness
+    int channels_ = 0;
+    int64_t unconverted_ = 0; // frames of a form that there is no resampler for
     int64_t damagedBefore_ = 0;
 };
 

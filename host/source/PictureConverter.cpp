@@ -48,6 +48,11 @@ av::Frame Bordered(const AVFrame& picture, int width, int height) {
     return whole;
 }
 
+bool IsNearlySame(double shape, double other) {
+    constexpr double kTolerance = 0.02;
+    return std::abs(shape / other - 1) < kTolerance;
+}
+
 bool IsFullRange(const AVFrame& picture) {
     return picture.color_range == AVCOL_RANGE_JPEG || picture.format == AV_PIX_FMT_YUVJ420P;
 }
@@ -115,11 +120,12 @@ PictureConverter::PictureConverter(const PictureStreamInfo& stream, bool deep, b
       crop_(stream.crop),
       rgbMatrix_(UsualMatrix(stream)),
       format_(deep ? AV_PIX_FMT_YUV420P10 : AV_PIX_FMT_YUV420P),
-      pixelShape_(IsOnSide(quarterTurns_) ? 1 / PixelShape(stream) : PixelShape(stream)),
-      size_(drawnInto || !crop_.CutsNothing() ? std::optional(StoredSize(stream)) : std::nullopt) {}
+      codedAspect_(stream.codedAspect),
+      stored_(StoredSize(stream)),
+      oneSize_(drawnInto || !crop_.CutsNothing()) {}
 
 av::Frame PictureConverter::Convert(AVFrame& picture) {
-    const bool hasSize = !size_ || *size_ == Size{picture.width, picture.height};
+    const bool hasSize = WholeSize(picture) == Size{picture.width, picture.height} && Widening(picture) == 1;
     av::Frame converted;
     if (picture.format == format_ && !IsFullRange(picture) && hasSize) {
         converted = av::NewFrame();
@@ -150,17 +156,28 @@ PictureConverter::Size PictureConverter::StoredSize(const PictureStreamInfo& str
     return IsOnSide(stream.quarterTurns) ? Size{whole.height, whole.width} : whole;
 }
 
+/// By how much wider the picture's pixels are than those of the stream; 1 when nearly the same. The container
+/// may tell another shape than the pictures do, but for all of them.
+double PictureConverter::Widening(const AVFrame& picture) const {
+    const auto shape = [](AVRational aspect) {
+        return aspect.num > 0 && aspect.den > 0 ? av_q2d(aspect) : 1;
+    };
+    const double widening = shape(picture.sample_aspect_ratio) / shape(codedAspect_);
+    return IsNearlySame(widening, 1) ? 1 : widening;
+}
+
+/// Of what the picture becomes.
+PictureConverter::Size PictureConverter::WholeSize(const AVFrame& picture) const {
+    return oneSize_ || Widening(picture) != 1 ? stored_ : Size{picture.width, picture.height};
+}
+
 /// How large the picture becomes in one of the size `whole`, where it keeps its shape unless that is nearly
 /// the same.
 PictureConverter::Size PictureConverter::SizeWithin(const Size& whole, const AVFrame& picture) const {
-    constexpr double kSameShape = 0.02;
-    if (whole == Size{picture.width, picture.height})
-        return whole;
-    const AVRational pixel = picture.sample_aspect_ratio;
-    const double widening = pixel.num > 0 && pixel.den > 0 ? av_q2d(pixel) / pixelShape_ : 1;
+    const double widening = Widening(picture);
     const double scaleX = whole.width / (picture.width * widening);
     const double scaleY = static_cast<double>(whole.height) / picture.height;
-    if (std::abs(scaleX / scaleY - 1) < kSameShape)
+    if (IsNearlySame(scaleX, scaleY))
         return whole;
     const auto even = [](double length) { return std::max(2, static_cast<int>(length / 2) * 2); };
     return scaleX < scaleY ? Size{whole.width, even(picture.height * scaleX)}
@@ -169,8 +186,8 @@ PictureConverter::Size PictureConverter::SizeWithin(const Size& whole, const AVF
 
 av::Frame PictureConverter::Scale(const AVFrame& picture) {
     const auto format = static_cast<AVPixelFormat>(picture.format);
-    const Size whole = size_.value_or(Size{picture.width, picture.height});
-    const Size size = size_ ? SizeWithin(whole, picture) : whole;
+    const Size whole = WholeSize(picture);
+    const Size size = SizeWithin(whole, picture);
     scaler_.reset(sws_getCachedContext(scaler_.release(), picture.width, picture.height, format, size.width,
                                        size.height, format_, SWS_BICUBIC | SWS_ACCURATE_RND, nullptr, nullptr,
                                        nullptr));

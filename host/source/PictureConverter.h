@@ -7,15 +7,13 @@
 #include "host/source/ColourMatrix.h"
 #include "host/source/SourceInfo.h"
 
-#include <optional>
-
 namespace movieconv {
 
 class PictureConverter {
 public:
     /// Pictures of such a stream are mirrored, turned and cropped as it says. `deep`: they get 10 bits. Where
     /// they are cropped or `drawnInto`, those of other sizes are brought to the one that the stream tells,
-    /// for which the places are meant.
+    /// for which the places are meant; and those that tell another shape of their pixels always.
     PictureConverter(const PictureStreamInfo& stream, bool deep, bool drawnInto);
 
     /// The picture in the engine's form. One that has it already is passed on without a copy. Null when it
@@ -30,6 +28,8 @@ private:
     };
 
     static Size StoredSize(const PictureStreamInfo& stream);
+    Size WholeSize(const AVFrame& picture) const;
+    double Widening(const AVFrame& picture) const;
     Size SizeWithin(const Size& whole, const AVFrame& picture) const;
     av::Frame Scale(const AVFrame& picture);
     av::Frame Turn(const AVFrame& picture) const;
@@ -40,8 +40,9 @@ private:
     const Crop crop_;
     const int rgbMatrix_;
     const AVPixelFormat format_;
-    const double pixelShape_;        // as stored, width to height
-    const std::optional<Size> size_; // as stored; without one each picture keeps its own
+    const AVRational codedAspect_; // of the stream's pictures, as they tell it
+    const Size stored_;
+    const bool oneSize_; // otherwise pictures of the same shape of pixels keep their own size
     av::Scaler scaler_;
 };
 

@@ -1,7 +1,6 @@
 #include "host/source/PictureDecoder.h"
 
 #include "host/source/MediaTime.h"
-#include "host/source/SourceTime.h"
 
 #include <algorithm>
 #include <utility>
@@ -60,14 +59,14 @@ PictureDecoder::~PictureDecoder() {
 
 double PictureDecoder::Seek(double seconds, int /*mode*/) {
     if (!thread_.joinable()) {
-        begin_ = ToMediaTime(seconds);
+        range_.BeginAt(ToMediaTime(seconds));
         demuxer_.Seek(seconds);
     }
     return seconds;
 }
 
 void PictureDecoder::EndAt(double seconds) {
-    end_ = ToMediaTime(seconds);
+    range_.EndAt(ToMediaTime(seconds));
 }
 
 VideoImage* PictureDecoder::GetCurrentImage() {
@@ -109,9 +108,7 @@ bool PictureDecoder::Advance() {
     image_.nPitchY = frame.linesize[0];
     image_.nPitchU = frame.linesize[1];
     image_.nPitchV = frame.linesize[2];
-    image_.llTime = image_.llTime2 = current_.stamp.time;
-    TellSourceTime(image_.reserved, current_.stamp.time);
-    image_.nDuration = static_cast<int32_t>(std::min<int64_t>(current_.stamp.duration, INT32_MAX));
+    TellTimes(image_, current_.stamp);
     return true;
 }
 
@@ -179,18 +176,10 @@ bool PictureDecoder::Hold(AVFrame& picture, std::optional<int64_t> stamp) {
 /// Hands the held picture on, unless it is over before the conversion begins. False when that ends before it,
 /// or nobody takes it any more.
 bool PictureDecoder::Deliver(StampRepair::Stamp stamp) {
-    if (end_ && stamp.time >= *end_) {
-        refused_ = true;
-        return false;
-    }
-    if (end_)
-        stamp.duration = std::min(stamp.duration, *end_ - stamp.time);
-    if (begin_ && stamp.time + stamp.duration <= *begin_)
-        return true;
-    if (const int64_t begin = begin_.value_or(0); first_ && (begin_ || stamp.time > begin)) {
-        stamp.duration += stamp.time - begin;
-        stamp.time = begin;
-    }
+    const PictureRange::Place place = range_.Fit(stamp);
+    refused_ = place == PictureRange::Place::kBehind;
+    if (place != PictureRange::Place::kWithin)
+        return !refused_;
     av::Frame picture = converter_.Convert(*held_);
     if (!picture) {
         ++unconverted_;
@@ -198,10 +187,14 @@ bool PictureDecoder::Deliver(StampRepair::Stamp stamp) {
     }
     if (burner_ != nullptr)
         burner_->Draw(*picture, stamp.time);
-    first_ = false;
+    range_.Gave();
     threads_.OnPicture(queue_.Size() == 0);
-    const std::size_t bytes = Bytes(*picture);
-    refused_ = !queue_.Push({std::move(picture), stamp}, bytes);
+    while (!refused_ && stamp.duration > 0) {
+        const StampRepair::Stamp one = TakeOffOne(stamp);
+        av::Frame given = av::CopyOf(*picture);
+        const std::size_t bytes = Bytes(*given);
+        refused_ = !queue_.Push({std::move(given), one}, bytes);
+    }
     return !refused_;
 }
 

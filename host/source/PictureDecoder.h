@@ -13,6 +13,7 @@
 #include "host/source/PictureConverter.h"
 #include "host/source/PictureFilter.h"
 #include "host/source/PictureNotes.h"
+#include "host/source/PictureRange.h"
 #include "host/source/StampRepair.h"
 #include "host/source/StreamDecoder.h"
 #include "host/source/SubtitleBurner.h"
@@ -96,11 +97,9 @@ private:
     StampRepair stamps_;
     LastStay lastStay_;
     av::Frame held_; // decoded, its stamp not settled yet
-    std::optional<int64_t> begin_;
-    std::optional<int64_t> end_;
+    PictureRange range_;
     int64_t decoded_ = 0;
-    int64_t skip_ = 0; // frames that a restarted decoder gives once more
-    bool first_ = true;
+    int64_t skip_ = 0;     // frames that a restarted decoder gives once more
     bool refused_ = false; // nobody takes pictures any more
     int64_t unconverted_ = 0;
 

@@ -36,9 +36,15 @@ std::vector<std::string> PictureLosses(const PictureStreamInfo& pictures, const 
                                     pictures.fineColours));
     if (pictures.transparent)
         texts.emplace_back("the transparency of its pictures was left out");
-    if (decoder.Notes().Captioned())
+    const PictureNotes& notes = decoder.Notes();
+    const int width = pictures.width + pictures.crop.left + pictures.crop.right;
+    const int height = pictures.height + pictures.crop.top + pictures.crop.bottom;
+    if (int64_t{notes.Width()} * notes.Height() > int64_t{width} * height)
+        texts.push_back(fmt::format("some of its pictures have {}x{} and were fitted into those of {}x{}",
+                                    notes.Width(), notes.Height(), pictures.width, pictures.height));
+    if (notes.Captioned())
         texts.emplace_back("its closed captions were left out");
-    if (pictures.stereoscopic || decoder.Notes().Stereoscopic())
+    if (pictures.stereoscopic || notes.Stereoscopic())
         texts.emplace_back("pictures for both eyes stayed as they are, in files that do not tell it");
     if (pictures.spherical)
         texts.emplace_back("spherical pictures stayed as they are, in files that do not tell it");

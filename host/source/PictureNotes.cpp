@@ -31,6 +31,10 @@ bool HoldsCaptions(const AVFrameSideData& captions) {
 } // namespace
 
 void PictureNotes::Look(const AVFrame& frame) {
+    if (int64_t{frame.width} * frame.height > int64_t{width_} * height_) {
+        width_ = frame.width;
+        height_ = frame.height;
+    }
     const AVFrameSideData* captions = av_frame_get_side_data(&frame, AV_FRAME_DATA_A53_CC);
     if (captions != nullptr && !captioned_)
         captioned_ = HoldsCaptions(*captions);

@@ -21,9 +21,15 @@ public:
     /// Whether the pictures hold the views of both eyes.
     bool Stereoscopic() const { return stereoscopic_; }
 
+    /// Of the largest picture, as stored.
+    int Width() const { return width_; }
+    int Height() const { return height_; }
+
 private:
     std::atomic<bool> captioned_{false};
     std::atomic<bool> stereoscopic_{false};
+    std::atomic<int> width_{0};
+    std::atomic<int> height_{0};
 };
 
 } // namespace movieconv

@@ -1,7 +1,6 @@
 #include "host/source/PictureStamps.h"
 
 #include "host/source/MediaTime.h"
-#include "host/source/SourceTime.h"
 
 #include <algorithm>
 
@@ -25,13 +24,13 @@ PictureStamps::PictureStamps(const Source& source, Demuxer& demuxer)
 }
 
 double PictureStamps::Seek(double seconds, int /*mode*/) {
-    begin_ = ToMediaTime(seconds);
+    range_.BeginAt(ToMediaTime(seconds));
     demuxer_.Seek(seconds);
     return seconds;
 }
 
 void PictureStamps::EndAt(double seconds) {
-    end_ = ToMediaTime(seconds);
+    range_.EndAt(ToMediaTime(seconds));
 }
 
 VideoImage* PictureStamps::GetCurrentImage() {
@@ -47,31 +46,30 @@ int PictureStamps::DecodeNext(int /*mode*/) {
     return ended_ ? 0 : 1;
 }
 
-/// As PictureDecoder delivers.
 bool PictureStamps::Advance() {
-    while (std::optional<StampRepair::Stamp> stamp = NextSettled()) {
-        if (end_ && stamp->time >= *end_)
+    while (rest_.duration <= 0) {
+        const std::optional<StampRepair::Stamp> stamp = NextSettled();
+        ranDry_ = !stamp;
+        if (!stamp)
             return false;
-        if (end_)
-            stamp->duration = std::min(stamp->duration, *end_ - stamp->time);
-        if (begin_ && stamp->time + stamp->duration <= *begin_)
-            continue;
-        if (const int64_t begin = begin_.value_or(0); first_ && (begin_ || stamp->time > begin)) {
-            stamp->duration += stamp->time - begin;
-            stamp->time = begin;
+        rest_ = *stamp;
+        switch (range_.Fit(rest_)) {
+        case PictureRange::Place::kBehind:
+            return false;
+        case PictureRange::Place::kBefore:
+            rest_ = {};
+            break;
+        case PictureRange::Place::kWithin:
+            range_.Gave();
+            break;
         }
-        first_ = false;
-        image_ = {};
-        image_.nType = kMediaTypePicture;
-        image_.nWidth = info_.format.nWidth;
-        image_.nHeight = info_.format.nHeight;
-        image_.llTime = image_.llTime2 = stamp->time;
-        TellSourceTime(image_.reserved, stamp->time);
-        image_.nDuration = static_cast<int32_t>(std::min<int64_t>(stamp->duration, INT32_MAX));
-        return true;
     }
-    ranDry_ = true;
-    return false;
+    image_ = {};
+    image_.nType = kMediaTypePicture;
+    image_.nWidth = info_.format.nWidth;
+    image_.nHeight = info_.format.nHeight;
+    TellTimes(image_, TakeOffOne(rest_));
+    return true;
 }
 
 std::optional<StampRepair::Stamp> PictureStamps::NextSettled() {

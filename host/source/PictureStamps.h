@@ -5,6 +5,7 @@
 
 #include "host/source/Demuxer.h"
 #include "host/source/LastStay.h"
+#include "host/source/PictureRange.h"
 #include "host/source/Source.h"
 #include "host/source/StampRepair.h"
 #include "media/Decoders.h"
@@ -57,11 +58,10 @@ private:
     LastStay lastStay_;
     std::priority_queue<int64_t, std::vector<int64_t>, std::greater<>> decoded_; // of packets, in media time
     std::optional<int64_t> firstKey_; // when the first picture that can be decoded is shown
-    std::optional<int64_t> begin_;
-    std::optional<int64_t> end_;
+    PictureRange range_;
+    StampRepair::Stamp rest_; // of the current picture's stay
     bool readAll_ = false;
     bool settledAll_ = false;
-    bool first_ = true;
     bool repaired_ = false;
     bool started_ = false;
     bool ended_ = false;

@@ -101,6 +101,7 @@ void SoundDecoder::Run() {
     failures_.Attempt([this] { DecodeAll(); });
     ranDry_ = !refused_;
     corrections_ = decoder_.Corrections();
+    channels_ = decoder_.Channels();
     queue_.Finish();
 }
 

@@ -34,6 +34,7 @@ public:
     /// Figures for progress and the closing report. Any thread.
     int64_t Damaged() const { return damaged_; }
     int Corrections() const { return corrections_; }
+    int Channels() const { return channels_; } ///< Of the source where it had most.
     double SecondsDelivered() const;
 
     /// Whether the source's last sound has been decoded and handed on. Any thread.
@@ -63,6 +64,7 @@ private:
     BoundedQueue<PcmDecoder::Chunk> queue_;
     std::atomic<int64_t> damaged_{0};
     std::atomic<int> corrections_{0};
+    std::atomic<int> channels_{0};
     std::atomic<bool> ranDry_{false};
     std::atomic<int64_t> samplesDelivered_{0};
     std::thread thread_;

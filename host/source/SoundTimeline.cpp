@@ -16,15 +16,17 @@ int64_t SoundTimeline::OffsetOf(int64_t stamp) const {
 }
 
 bool SoundTimeline::NeedsWitness(std::optional<int64_t> stamp) const {
-    return stamp && position_ > 0 && std::abs(OffsetOf(*stamp)) > sampleRate_;
+    return stamp && (position_ > 0 ? std::abs(OffsetOf(*stamp)) : OffsetOf(*stamp)) > sampleRate_;
 }
 
 SoundTimeline::Placement SoundTimeline::Place(std::optional<int64_t> stamp, int64_t samples,
                                               std::optional<int64_t> witness) {
     Placement placement;
     if (stamp) {
-        const int64_t offset = OffsetOf(*stamp);
+        int64_t offset = OffsetOf(*stamp);
         const bool witnessed = witness && std::abs(OffsetOf(*witness) - offset - samples) * 2 <= sampleRate_;
+        if (position_ == 0 && witness && offset > sampleRate_ && !witnessed)
+            offset = OffsetOf(*witness) - samples;
         if (position_ == 0 || IsGap(offset, witnessed)) {
             placement.silence = std::max<int64_t>(offset, 0);
             placement.cut = std::clamp<int64_t>(-offset, 0, samples);

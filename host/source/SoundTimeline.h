@@ -22,11 +22,12 @@ public:
     SoundTimeline(int sampleRate, int64_t begin) : sampleRate_(sampleRate), begin_(begin) {}
 
     /// Whether the frame of that stamp is to be held back until the next one is known: it lies more than a
-    /// second beside the timeline's end, where a single wild stamp would be.
+    /// second beside the timeline's end, or ahead of its beginning, where a single wild stamp would be.
     bool NeedsWitness(std::optional<int64_t> stamp) const;
 
     /// Places a frame of so many samples with its stamp in media time, nothing when it has none. `witness`:
-    /// the stamp of the next one, by which a step of more than a second is believed.
+    /// the stamp of the next one, by which a step of more than a second is believed. The first frame is
+    /// believed without one, and lies before a witness that contradicts it.
     Placement Place(std::optional<int64_t> stamp, int64_t samples,
                     std::optional<int64_t> witness = std::nullopt);
 

@@ -57,6 +57,7 @@ struct PictureStreamInfo {
     int quarterTurns = 0;     ///< Clockwise turns by 90 degrees that bring the stored picture upright.
     bool mirrored = false;    ///< The stored picture is mirrored left to right before it is turned.
     AVRational pixelAspect{}; ///< Of a pixel as shown, width to height; 1:1 when the source does not tell.
+    AVRational codedAspect{}; ///< As the stored pictures tell it at first; 0:1 when nobody tells.
     double frameRate = 0;     ///< Average pictures per second; 0 when the container tells none.
     double peakRate = 0; ///< Pictures per second where they follow each other closest; at least the average.
     double duration = 0; ///< Seconds; estimated when the container does not tell.

@@ -19,6 +19,8 @@ StreamDecoder::StreamDecoder(const AVCodecParameters& parameters, AVRational tim
 }
 
 bool StreamDecoder::Decode(const AVPacket* packet, const Sink& sink) {
+    if (packet != nullptr && packet->size == 0 && packet->side_data_elems == 0)
+        return true; // a picture that is shown for longer, which some containers tell so
     int result = avcodec_send_packet(context_.get(), packet);
     while (result == AVERROR(EAGAIN)) {
         if (!Receive(sink))

@@ -177,6 +177,8 @@ PictureStreamInfo DescribePictures(AVFormatContext& context, AVStream* stream) {
     info.width = turned ? parameters.height : parameters.width;
     info.height = turned ? parameters.width : parameters.height;
     info.pixelAspect = PixelAspect(context, stream, turned);
+    info.codedAspect =
+        parameters.sample_aspect_ratio.num > 0 ? parameters.sample_aspect_ratio : stream->sample_aspect_ratio;
     info.frameRate = ToldFrameRate(stream);
     info.interlaced = parameters.field_order > AV_FIELD_PROGRESSIVE;
     info.topFieldFirst = parameters.field_order == AV_FIELD_TT || parameters.field_order == AV_FIELD_BT;

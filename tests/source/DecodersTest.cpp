@@ -39,6 +39,10 @@ struct Begin {
 std::string CountedTs() {
     return Make("counted.ts", Join(CountedPictures(4), Beeps(4), H264Aac(), Args{"-c:a", "mp2"}));
 }
+/// What comes behind it is not seen when it is opened.
+std::string PaddedTs() {
+    return Make("padded.ts", Join(CountedPictures(4), Beeps(4), H264Aac(), Words("-c:a mp2 -muxrate 16M")));
+}
 std::string CountedMkv() {
     return Make("counted.mkv", Join(CountedPictures(4), Beeps(4), NearLossless(), Words("-g 30")));
 }
@@ -313,6 +317,16 @@ TEST(Decoders, SkipDamagedDataAndKeepTime) {
 }
 
 // What a decoder keeps back when the packets end comes out behind an error as well.
+TEST(Decoders, DoNotCountAnEmptyPacketAsDamaged) {
+    const movieconv::Source source(CountedMkv(), {});
+    const AVStream& stream = *source.PictureStream();
+    movieconv::StreamDecoder decoder(*stream.codecpar, stream.time_base, 1);
+    const av::Packet empty = av::NewPacket();
+    ASSERT_EQ(av_new_packet(empty.get(), 0), 0);
+    EXPECT_TRUE(decoder.Decode(empty.get(), [](AVFrame&) { return true; }));
+    EXPECT_EQ(decoder.Damaged(), 0);
+}
+
 TEST(Decoders, GiveWhatIsWholeBehindDamageAtTheEnd) {
     const std::string path = Make("noise-end.mp4", {"-f", "lavfi", "-i", "testsrc2=s=320x240:r=25:d=1", "-vf",
                                                     "noise=alls=60:allf=t", "-c:v", "libx264", "-qp", "10",
@@ -381,10 +395,13 @@ TEST(Decoders, JoinRecordingsThatStartANewClock) {
     const Folder folder;
     const std::string late = Make("late-clock.ts", Join(CountedPictures(4), Beeps(4), H264Aac(),
                                                         Args{"-c:a", "mp2", "-output_ts_offset", "5000"}));
+    const std::string renumbered =
+        Make("renumbered.ts", {"-i", CountedTs(), "-map", "0", "-c", "copy", "-mpegts_start_pid", "0x200"});
     const struct {
         std::string first, second;
         bool mixed;
-    } cases[] = {{late, CountedTs(), false},
+    } cases[] = {{PaddedTs(), renumbered, false},
+                 {late, CountedTs(), false},
                  {CountedTs(), CountedTs(), false},
                  {CountedTs(), late, false},
                  {late, CountedTs(), true}};
@@ -401,6 +418,67 @@ TEST(Decoders, JoinRecordingsThatStartANewClock) {
         EXPECT_NE(movie.Complaints()[0].find("jumped once"), std::string::npos) << movie.Complaints()[0];
         Movie again(folder / "joined.ts", {});
         EXPECT_NEAR(static_cast<double>(TakeAll(again, 6).pictures.size()), 50, 5) << first;
+    }
+}
+
+TEST(Decoders, TellWhatABroadcastAnnouncesLateAndTheyLeaveOut) {
+    const std::string other =
+        Make("other-codec.ts", Join(CountedPictures(4), Beeps(4), Words("-c:v mpeg2video -c:a mp2"),
+                                    Words("-mpegts_start_pid 0x200 -output_ts_offset 4")));
+    const Folder folder;
+    WriteFile(folder / "joined.ts", ReadFile(PaddedTs()) + ReadFile(other));
+    Movie movie(folder / "joined.ts", {});
+    const Seen seen = TakeAll(movie);
+    EXPECT_EQ(seen.pictures.size(), 100u);
+    EXPECT_EQ(Beginnings(seen, 44100).size(), 8u);
+    ASSERT_FALSE(movie.Complaints().empty());
+    EXPECT_EQ(movie.Complaints()[0],
+              "pictures of 4 s, which the source announces only at 4 s, were left out");
+    ASSERT_TRUE(movie.Missing());
+    EXPECT_NEAR(movie.Missing()->reached, 4, 0.2);
+    EXPECT_NEAR(movie.Missing()->announced, 8, 0.2);
+}
+
+TEST(Decoders, TellWhatDoesNotFitIntoWhatBeganSmaller) {
+    const auto part = [](const char* pictures, const char* form) {
+        return ReadFile(Make("part.ts", Join(Lavfi(std::string("color=white:r=25:d=1:s=") + pictures),
+                                             Beeps(1), Words(std::string("-c:v mpeg2video ") + form))));
+    };
+    const Folder folder;
+    WriteFile(folder / "joined.ts", part("160x120,setsar=4/3", "-c:a ac3 -ac 2 -ar 48000") +
+                                        part("160x120,setsar=1", "-c:a ac3 -ac 2 -ar 48000") +
+                                        part("320x240,setsar=1", "-c:a ac3 -ac 6 -ar 48000"));
+    Movie movie(folder / "joined.ts", {});
+    const Seen seen = TakeAll(movie);
+    ASSERT_GT(seen.pictures.size(), 70u); // of 75: where recordings meet, packets do not follow each other
+    for (const int square : {40, 60}) { // between black bars, as the first ones are wider than they are high
+        EXPECT_EQ(seen.pictures[square].width, 160);
+        EXPECT_NEAR(seen.pictures[square].luma, 235 * 0.75 + 16 * 0.25, 3);
+    }
+    EXPECT_NEAR(seen.pictures[10].luma, 235, 2);
+    const std::vector<std::string> told = movie.Complaints();
+    for (const char* text : {"some of its pictures have 320x240 and were fitted into those of 160x120",
+                             "some of its sound has 6 channels and got 2"})
+        EXPECT_EQ(std::count(told.begin(), told.end(), text), 1) << text;
+}
+
+TEST(Decoders, GiveAPictureThatStaysForLongSeveralTimes) {
+    const std::string movie = Make(
+        "stays.mp4", Join(Lavfi("testsrc=s=64x48:r=1/300:d=900"), Words("-c:v libx264 -preset ultrafast")));
+    for (const bool stampsOnly : {false, true}) {
+        Movie decoded(movie, {.stampsOnly = stampsOnly});
+        VideoDecoder& pictures = *decoded.Pictures();
+        int count = 0;
+        int64_t end = 0;
+        do {
+            const VideoImage* image = pictures.GetCurrentImage();
+            ASSERT_NE(image, nullptr);
+            EXPECT_EQ(image->llTime, end);
+            end = image->llTime + image->nDuration;
+            ++count;
+        } while (pictures.DecodeNext(1) > 0);
+        EXPECT_EQ(count, 6);
+        EXPECT_EQ(end, 900 * int64_t{kTicksPerSecond});
     }
 }
 

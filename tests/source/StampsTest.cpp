@@ -136,4 +136,17 @@ TEST(SoundTimeline, NeedsASecondWitnessForALargeGap) {
     EXPECT_EQ(timeline.Position(), 8500);
 }
 
+TEST(SoundTimeline, BelievesAFarBeginningUnlessTheNextStampContradicts) {
+    const struct {
+        std::optional<int64_t> witness;
+        int64_t silence;
+    } cases[] = {{Ms(5100), 5000}, {std::nullopt, 5000}, {Ms(100), 0}, {Ms(400), 300}};
+    for (const auto& test : cases) {
+        SoundTimeline timeline(kRate, 0);
+        EXPECT_TRUE(timeline.NeedsWitness(Ms(5000)));
+        EXPECT_FALSE(timeline.NeedsWitness(Ms(-5000)));
+        ExpectPlaced(timeline.Place(Ms(5000), 100, test.witness), test.silence, 0);
+    }
+}
+
 } // namespace

@@ -100,7 +100,8 @@ TEST(CopiedSound, GoesUnchangedIntoWhatHoldsIt) {
         {"copied_vorbis.mkv", "-c:a libvorbis", {"mkv", "webm", "ogg"}, {"ts", "mov"}, "mkv"},
         {"copied_mp3.mp4", "-c:a libmp3lame", {"mp4", "mkv", "avi", "ts", "mp3", "wav"}, {"webm"}, "mp4"},
         {"copied_ac3.ts", "-c:a ac3", {"mp4", "mov", "mkv", "avi", "ts", "m4a"}, {"flac"}, "mp4"},
-        {"copied_eac3.mkv", "-c:a eac3", {"mp4", "mov", "mkv", "ts"}, {"avi"}, "mkv"},
+        {"copied_eac3.mkv", "-c:a eac3", {"mp4", "mov", "mkv", "ts"}, {"avi", "m4a"}, "mkv"},
+        {"short_eac3.mkv", "-c:a eac3 -b:a 3000k", {"mkv", "ts"}, {"mp4"}, "mkv"},
         {"copied_flac.mkv", "-c:a flac", {"mkv", "flac", "ogg"}, {"mp4", "m4a"}, "flac"},
         {"copied_dts.mkv", "-c:a dca", {"mkv", "ts", "mp4"}, {"mov"}, "mkv"},
         {"copied_pcm.mov", "-c:a pcm_s24le", {"mov", "mkv", "wav"}, {"mp4"}, "mov"},
@@ -243,6 +244,34 @@ TEST(CopiedSound, EndsWhereItsFormChanges) {
     EXPECT_EQ(copied.code, 3) << copied.err;
     EXPECT_TRUE(Has(copied.err, "changes its form there and cannot be copied on")) << copied.err;
     EXPECT_EQ(Call({"-q", folder / "in.ts", folder / "converted.m4a"}).code, 0);
+}
+
+TEST(CopiedSound, KeepsFramesThatTellTheirFormButForAnotherRate) {
+    const struct {
+        const char* codec;
+        const char* first;
+        const char* second;
+        int code;
+    } cases[] = {
+        {"ac3", "-ac 2 -ar 48000", "-ac 6 -ar 48000", 0},
+        {"ac3", "-ar 48000", "-ar 32000", 3},
+        {"eac3", "-ar 48000", "-ar 44100", 3},
+        {"mp2", "-ac 1 -ar 48000", "-ac 2 -ar 48000", 0},
+        {"mp2", "-ar 48000", "-ar 44100", 3},
+        {"mp3", "-ar 44100", "-ar 22050", 3},
+        {"dca -strict -2", "-ar 48000", "-ar 44100", 3},
+    };
+    const Folder folder;
+    for (const auto& test : cases) {
+        SCOPED_TRACE(std::string(test.codec) + test.first + test.second);
+        std::string parts;
+        for (const std::string form : {test.first, test.second})
+            parts += ReadFile(Make("rates.ts", Join(Beeps(2), Words("-c:a " + (test.codec + (" " + form))))));
+        WriteFile(folder / "in.ts", parts);
+        const Result copied = Call({"-y", "--audio-codec", "copy", folder / "in.ts", folder / "out.mkv"});
+        EXPECT_EQ(copied.code, test.code) << copied.err;
+        EXPECT_NEAR(PacketsOf(folder / "out.mkv").back().time, test.code == 0 ? 4 : 2, 0.2);
+    }
 }
 
 TEST(CopiedSound, LeavesTheRestOfACutFrameOut) {

@@ -177,6 +177,19 @@ TEST(Program, CropsWhatItIsToldOrFinds) {
         EXPECT_EQ(movie.Info().pictures->width, test.width);
         EXPECT_EQ(movie.Info().pictures->height, test.height);
     }
+    const Args looks[] = {{"--info", source},
+                          {"--jobs", "2", source, folder / "jobs.mkv"},
+                          {"--plan", folder / "p.plan", source, folder / "plan.mkv"},
+                          {"--into", folder / "out", "--format", "mkv", source}};
+    for (const Args& arguments : looks) {
+        const Result result = Call(Join(Args{"--crop", "auto"}, arguments));
+        EXPECT_EQ(result.code, 0) << arguments[0] << result.err;
+    }
+    const Result piped = program::Run({"sh", "-c", R"(cat "$1" | "$0" --crop auto -y /dev/stdin "$2")",
+                                       MOVIECONV_PROGRAM, CountedMovie(), folder / "o.mkv"});
+    EXPECT_EQ(piped.code, 0) << piped.err;
+    EXPECT_NE(piped.err.find("cannot be looked for in a pipe"), std::string::npos) << piped.err;
+    EXPECT_NEAR(movieconv::Movie(folder / "o.mkv", {}).Info().duration, 4, 0.1);
     const Result plain = Call({"-y", "--crop", "auto", CountedMovie(), folder / "o.mkv"});
     EXPECT_NE(plain.err.find("no black borders"), std::string::npos) << plain.err;
     const Result tooMuch = Call({"-y", "--crop", "120:110:0:0", source, folder / "o.mkv"});

@@ -6,6 +6,8 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
+#include <fmt/format.h>
 #include <string>
 
 namespace {
@@ -183,6 +185,17 @@ TEST(Tracks, CarriedOnceMoreTheyStayAsTheyAre) {
     EXPECT_EQ(TextsOf(folder / "third.mkv"), TextsOf(folder / "first.mp4"));
 }
 
+TEST(Tracks, OfDamagedSoundAreTold) {
+    const Folder folder;
+    const std::string damaged = test_movies::Make(
+        "damaged-second.mkv", Join(CountedPictures(2), test_movies::Beeps(2), test_movies::Beeps(2),
+                                   Words("-map 0 -map 1 -map 2 -c:v mpeg4 -c:a mp3 -bsf:a:1 noise=20")));
+    const Result made = Call({damaged, folder / "out.mkv"});
+    EXPECT_EQ(made.code, 0) << made.err;
+    EXPECT_NE(made.err.find("damaged pieces of sound data were skipped in stream 2"), std::string::npos)
+        << made.err;
+}
+
 TEST(Tracks, AreChosenByNumberOrLanguage) {
     const Folder folder;
     const auto sounds = [&](const Args& options) {
@@ -259,6 +272,16 @@ TEST(Tracks, TextsMayBeFarApartAndLongButNotWithoutEnd) {
         EXPECT_TRUE(Has(texts, " 04:00:00,00") && Has(texts, "--> 08:00:00,00")) << texts;
         EXPECT_FALSE(Has(texts, "C") || Has(texts, "D")) << texts.size();
     }
+    std::string crowd;
+    for (const char* time : {"1,000", "1,040", "1,080"})
+        for (int text = 0; text < 40; ++text)
+            crowd += fmt::format("{}\n00:00:0{} --> 00:00:03,000\n{} {}\n\n", text, time, time, text);
+    WriteFile(folder / "crowd.srt", crowd);
+    ASSERT_EQ(Call({TwoSounds(), folder / "crowd.mkv", "--subtitle-file", folder / "crowd.srt"}).code, 0);
+    const Args lines = Words(
+        Ffprobe(folder / "crowd.mkv", Words("-select_streams s -show_entries packet=pts_time -of csv=p=0")));
+    for (const int text : {0, 40, 80}) // each time the first of its forty
+        EXPECT_EQ(std::count(lines.begin(), lines.end(), lines.at(text)), 40) << lines.at(text);
     const std::string title(256, 't'); // one more than broadcasts have
     const Result made =
         Call({TwoSounds(), folder / "out.ts", "--length", "1", "--metadata", "title=" + title});

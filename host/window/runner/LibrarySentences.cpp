@@ -38,6 +38,7 @@ constexpr const char* kSentences[] = {
     // Why a conversion is refused.
     QT_TRANSLATE_NOOP("Library", "%1 cannot hold “%2” sound as it is; no format can"),
     QT_TRANSLATE_NOOP("Library", "%1 cannot hold “%2” sound as it is; %3 can"),
+    QT_TRANSLATE_NOOP("Library", "%1 cannot hold short frames of “%2” sound as it is; MKV can"),
     QT_TRANSLATE_NOOP("Library", "%1 cannot begin the sound as it is %2 s behind the pictures; MKV can"),
     QT_TRANSLATE_NOOP("Library", "its sound has no form that could be copied; convert it instead"),
     QT_TRANSLATE_NOOP("Library",
@@ -165,6 +166,7 @@ constexpr const char* kSentences[] = {
     QT_TRANSLATE_NOOP("Library", "“%1” needs about %2, but only %3 are free"),
     QT_TRANSLATE_NOOP("Library", "no space is left for “%1”; waiting until there is room for %2"),
     QT_TRANSLATE_NOOP("Library", "no black borders were found"),
+    QT_TRANSLATE_NOOP("Library", "black borders cannot be looked for in a pipe"),
     QT_TRANSLATE_NOOP("Library", "the pictures are cropped to %1x%2: %3 above, %4 below, %5 left, %6 right"),
 
     // What of the source was put right or left out.
@@ -191,6 +193,12 @@ constexpr const char* kSentences[] = {
     QT_TRANSLATE_NOOP("Library", "%1 damaged pieces of sound data were skipped"),
     QT_TRANSLATE_NOOP("Library", "%1 pictures had a missing or falling time stamp"),
     QT_TRANSLATE_NOOP("Library", "the sound had %1 gaps or overlaps, which were closed"),
+    QT_TRANSLATE_NOOP("Library", "some of its pictures have %1x%2 and were fitted into those of %3x%4"),
+    QT_TRANSLATE_NOOP("Library", "some of its sound has %1 channels and got %2"),
+    QT_TRANSLATE_NOOP("Library", "%1 damaged pieces of sound data were skipped in stream %2"),
+    QT_TRANSLATE_NOOP("Library", "the sound of stream %1 had %2 gaps or overlaps, which were closed"),
+    QT_TRANSLATE_NOOP("Library", "pictures of %1 s, which the source announces only at %2 s, were left out"),
+    QT_TRANSLATE_NOOP("Library", "sound of %1 s, which the source announces only at %2 s, was left out"),
 
     // What is wrong with a preset.
     QT_TRANSLATE_NOOP("Library", "%1: the parent “%2” has this preset as a parent itself"),

@@ -389,6 +389,10 @@
         <translation>%1 kann Ton in „%2“ nicht unverändert aufnehmen; diese können es: %3</translation>
     </message>
     <message>
+        <source>%1 cannot hold short frames of “%2” sound as it is; MKV can</source>
+        <translation>%1 kann kurze Blöcke von Ton „%2“ nicht unverändert enthalten; MKV kann es</translation>
+    </message>
+    <message>
         <source>%1 cannot begin the sound as it is %2 s behind the pictures; MKV can</source>
         <translation>%1 kann unveränderten Ton nicht %2 s nach den Bildern beginnen lassen; MKV kann es</translation>
     </message>
@@ -543,6 +547,10 @@
     <message>
         <source>no black borders were found</source>
         <translation>schwarze Ränder wurden nicht gefunden</translation>
+    </message>
+    <message>
+        <source>black borders cannot be looked for in a pipe</source>
+        <translation>in einer Pipe kann nicht nach schwarzen Rändern gesucht werden</translation>
     </message>
     <message>
         <source>%1 cannot hold %2</source>
@@ -1004,6 +1012,30 @@
     <message>
         <source>the sound had %1 gaps or overlaps, which were closed</source>
         <translation>Lücken oder Überlappungen im Ton wurden geschlossen: %1</translation>
+    </message>
+    <message>
+        <source>some of its pictures have %1x%2 and were fitted into those of %3x%4</source>
+        <translation>einige Bilder haben %1x%2 und wurden in solche von %3x%4 eingepasst</translation>
+    </message>
+    <message>
+        <source>some of its sound has %1 channels and got %2</source>
+        <translation>ein Teil des Tons hat %1 Kanäle und bekam %2</translation>
+    </message>
+    <message>
+        <source>%1 damaged pieces of sound data were skipped in stream %2</source>
+        <translation>beschädigte Stücke der Tondaten in Spur %2 wurden übersprungen: %1</translation>
+    </message>
+    <message>
+        <source>the sound of stream %1 had %2 gaps or overlaps, which were closed</source>
+        <translation>Lücken oder Überlappungen im Ton von Spur %1 wurden geschlossen: %2</translation>
+    </message>
+    <message>
+        <source>pictures of %1 s, which the source announces only at %2 s, were left out</source>
+        <translation>Bilder von %1 s, die die Quelle erst bei %2 s ankündigt, wurden weggelassen</translation>
+    </message>
+    <message>
+        <source>sound of %1 s, which the source announces only at %2 s, was left out</source>
+        <translation>Ton von %1 s, den die Quelle erst bei %2 s ankündigt, wurde weggelassen</translation>
     </message>
     <message>
         <source>%1: the parent “%2” has this preset as a parent itself</source>

@@ -1,0 +1,47 @@
+// Which pictures of a source are handed out, and with what stamps.
+#ifndef MOVIECONV_HOST_SOURCE_PICTURERANGE_H
+#define MOVIECONV_HOST_SOURCE_PICTURERANGE_H
+
+#include "host/source/StampRepair.h"
+#include "media/MediaRecords.h"
+
+#include <cstdint>
+#include <optional>
+
+namespace movieconv {
+
+/// One rule for those who decode pictures and those who only look at their stamps: plans depend on it. Media
+/// time.
+class PictureRange {
+public:
+    enum class Place { kBefore, kWithin, kBehind };
+
+    /// The picture shown at `begin` is the first one and is stamped with it. Without it, the source's first
+    /// picture is, and is stamped with 0 if it comes later.
+    void BeginAt(int64_t begin) { begin_ = begin; }
+
+    /// The last picture is the one before `end`, where it ends, too.
+    void EndAt(int64_t end) { end_ = end; }
+
+    /// Where a picture lies; its stamp is fitted in.
+    Place Fit(StampRepair::Stamp& stamp) const;
+
+    /// One was handed out.
+    void Gave() { first_ = false; }
+
+private:
+    std::optional<int64_t> begin_;
+    std::optional<int64_t> end_;
+    bool first_ = true;
+};
+
+/// What can be told of a stay at once, since a record's duration has 32 bits. The rest of it stays in `stay`,
+/// with a duration of 0 where nothing is left: the same picture is handed out once more for that.
+StampRepair::Stamp TakeOffOne(StampRepair::Stamp& stay);
+
+/// Enters the times into a picture's record.
+void TellTimes(VideoImage& image, const StampRepair::Stamp& stamp);
+
+} // namespace movieconv
+
+#endif
