@@ -47,11 +47,28 @@ int LateStreams::Replaced(const AVFormatContext& context, int stream) const {
     return -1;
 }
 
+/// Than all that are taken.
+bool LateStreams::IsOfOtherProgramme(const AVFormatContext& context, int stream) const {
+    bool isOfAny = false;
+    for (unsigned i = 0; i < context.nb_programs; ++i) {
+        const AVProgram& program = *context.programs[i];
+        const std::vector<int> all = StreamsLike(context, program, stream);
+        if (std::find(all.begin(), all.end(), stream) == all.end())
+            continue;
+        isOfAny = true;
+        if (std::any_of(places_.begin(), places_.end(),
+                        [&](const auto& taken) { return taken.second.program == program.id; }))
+            return false;
+    }
+    return isOfAny;
+}
+
 void LateStreams::Leave(const AVFormatContext& context, int stream, int64_t begin, int64_t end) {
     const AVMediaType kind = context.streams[stream]->codecpar->codec_type;
     if (kind != AVMEDIA_TYPE_VIDEO && kind != AVMEDIA_TYPE_AUDIO)
         return;
-    if (stream < known_ && Replaced(context, stream) < 0) // told before the conversion
+    const bool wasTold = stream < known_ && Replaced(context, stream) < 0; // before the conversion
+    if (wasTold || IsOfOtherProgramme(context, stream))
         return;
     const StreamKind told = kind == AVMEDIA_TYPE_VIDEO ? StreamKind::kPictures : StreamKind::kSound;
     Left& left = left_.try_emplace(stream, Left{told, begin, end}).first->second;

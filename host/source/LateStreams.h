@@ -45,6 +45,8 @@ private:
         std::size_t position; // among its kind
     };
 
+    bool IsOfOtherProgramme(const AVFormatContext& context, int stream) const;
+
     const int known_;
     std::map<int, Place> places_; // by stream
     std::map<int, Left> left_;

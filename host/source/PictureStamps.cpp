@@ -53,17 +53,13 @@ bool PictureStamps::Advance() {
         if (!stamp)
             return false;
         rest_ = *stamp;
-        switch (range_.Fit(rest_)) {
-        case PictureRange::Place::kBehind:
-            return false;
-        case PictureRange::Place::kBefore:
+        const PictureRange::Place place = range_.Fit(rest_);
+        if (place != PictureRange::Place::kWithin)
             rest_ = {};
-            break;
-        case PictureRange::Place::kWithin:
-            range_.Gave();
-            break;
-        }
+        if (place == PictureRange::Place::kBehind)
+            return false;
     }
+    range_.Gave();
     image_ = {};
     image_.nType = kMediaTypePicture;
     image_.nWidth = info_.format.nWidth;

@@ -473,7 +473,7 @@ TEST(Decoders, GiveAPictureThatStaysForLongSeveralTimes) {
         do {
             const VideoImage* image = pictures.GetCurrentImage();
             ASSERT_NE(image, nullptr);
-            EXPECT_EQ(image->llTime, end);
+            EXPECT_EQ(int64_t{image->llTime}, end); // which lies at no multiple of 8
             end = image->llTime + image->nDuration;
             ++count;
         } while (pictures.DecodeNext(1) > 0);
