@@ -92,7 +92,8 @@ const AVCodecParameters& CopiedSound::Describe() {
         HasAdtsHeader(*first))
         deframer_ = std::make_unique<Deframer>(*parameters_, timeBase_, *first);
     if (first && parameters_->codec_id == AV_CODEC_ID_EAC3)
-        parameters_->frame_size = Eac3Samples(*first);
+        if (const int samples = Eac3Samples(*first); samples > 0)
+            parameters_->frame_size = samples;
     if (parameters_->codec_id == AV_CODEC_ID_VORBIS)
         vorbis_.reset(av_vorbis_parse_init(parameters_->extradata, parameters_->extradata_size));
     parameters_->initial_padding = first && bounds_.begin == 0 ? static_cast<int>(RunUp(*first)) : 0;

@@ -222,10 +222,11 @@ bool Demuxer::ReadOne() {
 void Demuxer::GiveOut(av::Packet packet) {
     const AVFormatContext& context = *source_.Reader().Context();
     const int stream = packet->stream_index;
-    if (queues_.IsTaken(stream))
+    const bool isTaken = queues_.IsTaken(stream);
+    if (isTaken)
         late_.See(context, stream);
-    else if (const int replaced = late_.Replaced(context, stream);
-             replaced >= 0 && AreAlike(*context.streams[replaced], *context.streams[stream]))
+    const int replaced = isTaken ? -1 : late_.Replaced(context, stream);
+    if (replaced >= 0 && AreAlike(*context.streams[replaced], *context.streams[stream]))
         packet->stream_index = replaced;
     RepairClock(*packet);
     {
@@ -233,7 +234,8 @@ void Demuxer::GiveOut(av::Packet packet) {
         const AVRational unit = context.streams[packet->stream_index]->time_base;
         const std::lock_guard lock(mutex_);
         if (end && !queues_.IsTaken(packet->stream_index))
-            late_.Leave(context, stream, source_.Reader().MediaTime(StampOf(*packet), unit), *end);
+            late_.Leave(context, stream, replaced >= 0, source_.Reader().MediaTime(StampOf(*packet), unit),
+                        *end);
         if (!queues_.Add(std::move(packet), end))
             return;
     }

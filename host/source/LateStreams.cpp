@@ -63,11 +63,12 @@ bool LateStreams::IsOfOtherProgramme(const AVFormatContext& context, int stream)
     return isOfAny;
 }
 
-void LateStreams::Leave(const AVFormatContext& context, int stream, int64_t begin, int64_t end) {
+void LateStreams::Leave(const AVFormatContext& context, int stream, bool replaces, int64_t begin,
+                        int64_t end) {
     const AVMediaType kind = context.streams[stream]->codecpar->codec_type;
     if (kind != AVMEDIA_TYPE_VIDEO && kind != AVMEDIA_TYPE_AUDIO)
         return;
-    const bool wasTold = stream < known_ && Replaced(context, stream) < 0; // before the conversion
+    const bool wasTold = stream < known_ && !replaces; // before the conversion
     if (wasTold || IsOfOtherProgramme(context, stream))
         return;
     const StreamKind told = kind == AVMEDIA_TYPE_VIDEO ? StreamKind::kPictures : StreamKind::kSound;

@@ -8,7 +8,6 @@
 #include <cstddef>
 #include <cstdint>
 #include <map>
-#include <optional>
 #include <vector>
 
 namespace movieconv {
@@ -33,8 +32,8 @@ public:
     /// programme, which does not name that one any more. -1 without one.
     int Replaced(const AVFormatContext& context, int stream) const;
 
-    /// A packet of a stream that nobody takes was read.
-    void Leave(const AVFormatContext& context, int stream, int64_t begin, int64_t end);
+    /// A packet of a stream that nobody takes was read; `replaces`: the stream has the place of another one.
+    void Leave(const AVFormatContext& context, int stream, bool replaces, int64_t begin, int64_t end);
 
     /// In the order of their numbers.
     std::vector<Left> AllLeft() const;

@@ -2,8 +2,6 @@
 
 #include "host/source/MediaTime.h"
 
-#include <algorithm>
-
 namespace movieconv {
 namespace {
 
