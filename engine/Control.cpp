@@ -79,6 +79,10 @@ int ConvThread::Start(double begin, double length, OpaqueWindowPtr* window, Prog
 }
 
 int ConvThread::svc() {
+    if (ownVideo)
+        ownVideo->BeginConversion();
+    if (ownAudio)
+        ownAudio->BeginConversion();
     try {
         Dispatch();
     } catch (...) {

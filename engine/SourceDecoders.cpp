@@ -53,6 +53,8 @@ std::unique_ptr<SourceVideo> SourceVideo::Make(const MCVideoSource* table) {
 
 // Reads the next picture.
 bool SourceVideo::Load() {
+    if (isBehind && source.pfnSeek)
+        Seek(0.0, 0);
     const VideoFormat& format = info.format;
     const double rate = format.dFrameRate;
     image = {};
@@ -80,7 +82,7 @@ bool SourceVideo::Load() {
 }
 
 double SourceVideo::Seek(double seconds, int /*mode*/) {
-    ended = loaded = false;
+    ended = loaded = isBehind = false;
     if (!source.pfnSeek) {
         // Skipping starts where the source stands, as after the conversion before.
         while (Load() && image.llTime < Ticks(seconds)) {
@@ -94,7 +96,7 @@ double SourceVideo::Seek(double seconds, int /*mode*/) {
 }
 
 VideoImage* SourceVideo::GetCurrentImage() {
-    return loaded || Load() ? &image : nullptr;
+    return (loaded && !isBehind) || Load() ? &image : nullptr;
 }
 
 int SourceVideo::DecodeNext(int /*mode*/) {
@@ -121,6 +123,8 @@ std::unique_ptr<SourceAudio> SourceAudio::Make(const MCAudioSource* table) {
 
 // Reads the next block.
 bool SourceAudio::Load() {
+    if (isBehind && source.pfnSeek)
+        Seek(0.0);
     const AudioFormat& format = info.format;
     block = {};
     block.nType = kMediaTypeSound;
@@ -148,7 +152,7 @@ bool SourceAudio::Load() {
 }
 
 double SourceAudio::Seek(double to) {
-    ended = waits = false;
+    ended = waits = isBehind = false;
     if (!source.pfnSeek) {
         while (!waits && Load())
             waits = seconds > to || to <= 0.0;

@@ -23,6 +23,12 @@ public:
     /// Belongs to a converter from now on: its book is told of errors, and the table of the end.
     void JoinConverter(ResultBook& book) { results = &book; }
 
+    /// Another conversion begins, on the thread that reads: what an earlier one left off is not its start.
+    void BeginConversion() {
+        ended = false;
+        isBehind = count > 0;
+    }
+
 protected:
     explicit SourceTable(const Table& table) : source(table) {}
     ~SourceTable() {
@@ -37,7 +43,8 @@ protected:
 
     const Table source;
     bool ended = false;
-    int64_t count = 0; // records given
+    bool isBehind = false; // stands where an earlier conversion ended, and was not sought since
+    int64_t count = 0;     // records given
 
 private:
     ResultBook* results = nullptr; // null until it belongs to a converter

@@ -27,9 +27,10 @@ typedef struct MCVideoSource {
     int (*pfnGetFormat)(void* pUser, VideoFormat* format);
 
     /// Moves to the picture shown at `seconds`. Called at most once in a conversion, before its first
-    /// picture, and at a begin of 0 not at all where there is sound too, or pictures alone. Nonzero, or 0
-    /// when that fails, which ends the conversion as an error. May be null: pictures before `seconds` are
-    /// read and left out.
+    /// picture, and at a begin of 0 not at all where there is sound too, or pictures alone, unless an earlier
+    /// conversion has read from the source. Nonzero, or 0 when that fails, which ends the conversion as an
+    /// error. May be null: pictures before `seconds` are read and left out, and a later conversion goes on
+    /// where the source stands.
     int (*pfnSeek)(void* pUser, double seconds);
 
     /// Gives the next picture: 1. At the end 0; a negative number of the host's own is an error, which ends

@@ -46,7 +46,7 @@ bool ClipCutter::Next() {
         return false;
     Begin(movie_.Pictures()->GetCurrentImage()->llTime);
     picturesDone_ = false;
-    movie_.EndFileAt(BesideBounds::kOpen);
+    movie_.Beside().EndFileAt(BesideBounds::kOpen);
     return true;
 }
 
@@ -131,7 +131,7 @@ int ClipCutter::CutPictures::DecodeNext(int mode) {
     const std::optional<int64_t> next = owner_.movie_.TimeOfNextPicture();
     if (next && *next >= owner_.end_) { // it stays where it is until Next
         owner_.picturesDone_ = true;
-        owner_.movie_.EndFileAt(*next);
+        owner_.movie_.Beside().EndFileAt(*next);
     } else if (owner_.movie_.Pictures()->DecodeNext(mode) < 1) {
         owner_.picturesDone_ = true;
     }

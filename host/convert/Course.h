@@ -90,7 +90,7 @@ private:
     WriterWatch watch_;
     FileLedger files_;
     Engine engine_;
-    std::vector<Carried::Subtitles> subtitles_; // that are in the output
+    std::vector<SubtitleTrack> subtitles_; // that are in the output
     double earlier_ = 0;                        // seconds, in the clips that are there
 
     // The engine's worker sets these.

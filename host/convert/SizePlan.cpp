@@ -1,7 +1,7 @@
 #include "host/convert/SizePlan.h"
 
 #include "host/convert/Amounts.h"
-#include "host/convert/CarryOver.h"
+#include "host/convert/CarryPlan.h"
 #include "host/convert/CodecPlan.h"
 #include "host/convert/EncodePlan.h"
 #include "host/convert/Failure.h"
@@ -96,7 +96,7 @@ Request FitIntoSize(Request request, const SourceInfo& source) {
     if (pictures && IsAmong(ChooseVideoCodec(request, format).value_or(0), {FourCC("FFV1"), FourCC("GIF ")}))
         throw Failure(Category::kRequest, "a codec without a bit rate cannot keep below a size");
     const bool packets = IsAmong(format.fccFormat, {FourCC("TS  "), FourCC("MPG ")});
-    const auto tracks = static_cast<double>(1 + FurtherSound(source, request, format).size());
+    const auto tracks = static_cast<double>(1 + CarryPlan(source, request, format).FurtherSound().size());
     const double packetRate = (pictures ? source.pictures->peakRate : 0) +
                               (sound ? tracks * source.sound->sampleRate / kSamplesPerPacket : 0);
     const double free = static_cast<double>(*request.maxSize) * 8 * (packets ? kPacketStreamShare : kShare) -

@@ -1,7 +1,7 @@
 #include "host/convert/SoundLoss.h"
 
 #include "ffmpeg/Loudspeakers.h"
-#include "host/convert/CarryOver.h"
+#include "host/convert/CarryPlan.h"
 #include "host/convert/CodecPlan.h"
 #include "host/convert/EncodePlan.h"
 #include "writer/WriterStatus.h"
@@ -57,7 +57,7 @@ std::vector<std::string> TellSoundLoss(const SourceInfo& source, const Request& 
         TellLossOf(sound, PlanSound(request, format, sound), param, texts);
     };
     tell(*source.sound);
-    for (const int stream : FurtherSound(source, request, format))
+    for (const int stream : CarryPlan(source, request, format).FurtherSound())
         tell(*source.streams[static_cast<std::size_t>(stream)].sound);
     std::sort(texts.begin(), texts.end());
     texts.erase(std::unique(texts.begin(), texts.end()), texts.end());

@@ -2,8 +2,7 @@
 #ifndef MOVIECONV_HOST_SOURCE_MOVIE_H
 #define MOVIECONV_HOST_SOURCE_MOVIE_H
 
-#include "host/source/BesideTrack.h"
-#include "host/source/CopiedSound.h"
+#include "host/source/BesideTracks.h"
 #include "host/source/Demuxer.h"
 #include "host/source/Failures.h"
 #include "host/source/PictureDecoder.h"
@@ -11,10 +10,7 @@
 #include "host/source/SoundDecoder.h"
 #include "host/source/Source.h"
 #include "host/source/SubtitleBurner.h"
-#include "host/source/SubtitleFile.h"
 
-#include <atomic>
-#include <map>
 #include <memory>
 #include <optional>
 #include <string>
@@ -50,31 +46,11 @@ public:
     /// conversion.
     void EndPicturesAt(double seconds);
 
-    /// How the output divides the source, in seconds, for the streams beside. Only before the conversion, and
-    /// before ReadBeside.
-    void SetBounds(double begin, bool ends, bool isCut);
-
-    /// Reads a stream beside those that are converted, as PCM or as its packets; the track lives as long as
-    /// the movie. Once for a stream, only before the conversion. Throws SourceError.
-    BesideSound& ReadSoundBeside(int stream);
-    BesidePackets& ReadPacketsBeside(int stream);
-
-    /// Likewise, of sound. Its Describe is for DescribeCopied to call.
-    CopiedSound& CopySoundBeside(int stream);
-
-    /// CopiedSound::Describe, for which reading begins: once all streams beside are known.
-    const AVCodecParameters& DescribeCopied(CopiedSound& sound);
-
-    /// Subtitles of a file of their own, whose times are the movie's. `stream` is set to their description.
-    BesidePackets& ReadSubtitleFile(const std::string& path, const std::string& charset,
-                                    const AVStream*& stream);
+    /// The streams that go into the output beside Pictures() and Sound().
+    BesideTracks& Beside() { return beside_; }
 
     /// A stream of Info() as the container describes it. Valid until the conversion.
     const AVStream& StreamOf(int stream) const { return *source_.Reader().Context()->streams[stream]; }
-
-    /// Where the file ends that is being written, in media time, when another one follows it: for the streams
-    /// beside. kOpen when it is not known (any more). Any thread.
-    void EndFileAt(int64_t time) { bounds_.fileEnd = time; }
 
     /// Ends both streams at once, so that nobody waits for a slow source. Any thread.
     void Stop();
@@ -106,8 +82,6 @@ public:
 
 private:
     std::optional<Shortfall> LateShortfall(const Reached& ends) const;
-    std::map<int, std::vector<av::Packet>>& EarlierCues();
-    void AddBeside(int stream, std::unique_ptr<BesideTrack> track);
 
     const SourceChoice choice_;
     Source source_;
@@ -117,16 +91,7 @@ private:
     std::unique_ptr<PictureDecoder> pictures_;
     std::unique_ptr<PictureStamps> stamps_; // instead of pictures_
     std::unique_ptr<SoundDecoder> sound_;
-    BesideBounds bounds_;
-    double begin_ = 0;                                   // seconds
-    std::map<int, std::vector<av::Packet>> earlierCues_; // by stream, from before the begin
-    bool earlierCuesRead_ = false;
-    std::atomic<int64_t> cuesInOtherCharset_{0};
-    std::vector<int> besideStreams_;
-    std::vector<std::unique_ptr<SubtitleFile>> subtitleFiles_;
-    std::vector<std::unique_ptr<BesideTrack>> beside_;
-    std::vector<const BesideSound*> besideSound_; // of these
-    bool soundIsCopied_ = false;
+    BesideTracks beside_;
 };
 
 } // namespace movieconv

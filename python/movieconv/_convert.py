@@ -39,7 +39,8 @@ def _program() -> str:
 
 class Conversion:
     """A running conversion. Iterating over it gives FileProgress until it is done and raises ConversionError when
-    it fails; `wait()` does that without the news. Leaving a `with` block early stops it."""
+    it fails; `wait()` does that without the news. Leaving a `with` block early stops it; where it has failed before and
+    nobody has read its news, that raises ConversionError, too."""
 
     def __init__(self, arguments: List[str]) -> None:
         self._messages = tempfile.TemporaryFile()
@@ -48,12 +49,17 @@ class Conversion:
             stderr=self._messages)
         self._paused = False
         self._stopped = False
+        self._concluded = False
+        self._error: Optional[str] = None
         self.warnings: List[str] = []  # what was put right or is worth knowing
         self.files: List[str] = []  # complete, on the disk, under their names
 
     def __iter__(self) -> Iterator[FileProgress]:
         errors: List[str] = []
         assert self._process.stdout is not None
+        if self._concluded:
+            self._raise_error()
+            return
         for line in self._process.stdout:
             event = json.loads(line)
             if event["event"] == "progress":
@@ -67,12 +73,25 @@ class Conversion:
 
     def _conclude(self, errors: List[str]) -> None:
         code = self._process.wait()
-        if code == 0 or (self._stopped and code == 6):
-            return
         self._messages.seek(0)
         messages = self._messages.read().decode("utf-8", "replace").strip()
+        self._close()
+        # Before the program can take the signal, it ends by it.
+        if code == 0 or (self._stopped and code in (6, -signal.SIGTERM)):
+            return
         text = " ".join(errors) or messages or f"The program movieconv ended with {code}."
-        raise ConversionError(text)
+        self._error = text
+        self._raise_error()
+
+    def _raise_error(self) -> None:
+        if self._error is not None:
+            raise ConversionError(self._error)
+
+    def _close(self) -> None:
+        self._concluded = True
+        assert self._process.stdout is not None
+        self._process.stdout.close()
+        self._messages.close()
 
     def wait(self) -> None:
         """Returns when the conversion is done; raises as iterating does."""
@@ -107,16 +126,19 @@ class Conversion:
     def __enter__(self) -> "Conversion":
         return self
 
-    def __exit__(self, *_error: Any) -> None:
+    def __exit__(self, kind: Any, *_error: Any) -> None:
+        if self._concluded:
+            return
         if self._process.poll() is None:
             self.stop()
-            assert self._process.stdout is not None
-            for _ in self._process.stdout:  # it waits for a reader before it ends
-                pass
-            self._process.wait()
-        if self._process.stdout is not None:
-            self._process.stdout.close()
-        self._messages.close()
+        elif kind is None:
+            self.wait()  # it has ended by itself: whether well, nobody has asked
+            return
+        assert self._process.stdout is not None
+        for _ in self._process.stdout:  # it waits for a reader before it ends
+            pass
+        self._process.wait()
+        self._close()
 
 
 def convert(source: "str | os.PathLike[str]", output: "str | os.PathLike[str]", *options: str) -> Conversion:

@@ -5,7 +5,6 @@ from __future__ import annotations
 import ctypes as c
 import enum
 import os
-import threading
 from dataclasses import dataclass
 from typing import Any, Callable, Iterable, Optional, Tuple
 
@@ -82,24 +81,24 @@ class LogLevel(enum.IntEnum):
     DEBUG = 4
 
 
-_log_function: Any = None  # what the library calls must stay alive
-_log_lock = threading.Lock()  # that the last one set is the one kept
+_log_function: Optional[Callable[[LogLevel, str], None]] = None
+_log_is_taken = False
+
+
+@lib.LogFunction
+def _log(_user: Any, level: int, line: bytes) -> None:
+    function = _log_function
+    if function is not None:
+        function(LogLevel(level), line.decode("utf-8", "replace"))
 
 
 def set_log_function(function: Optional[Callable[[LogLevel, str], None]]) -> None:
     """Sends every line of the library and of FFmpeg to `function(level, line)`; None drops them, which is how it
-    is at first. It is called on any thread, possibly on several at once. What it raises is lost."""
+    is at first. It is called on any thread, possibly on several at once, and may still be called for a line under way
+    when another one is set. What it raises is lost."""
     global _log_function
-
-    def take(_user: Any, level: int, line: bytes) -> None:
-        if function is not None:
-            function(LogLevel(level), line.decode("utf-8", "replace"))
-
-    callback = lib.LogFunction(take)
-    with _log_lock:
-        if lib.library().MCSetLogCallback(callback, None) == 0:
-            raise MemoryError
-        _log_function = callback
+    _log_function = function
+    _engine()
 
 
 def version() -> Tuple[int, int, int]:
@@ -109,9 +108,12 @@ def version() -> Tuple[int, int, int]:
 
 
 def _engine() -> Any:
+    global _log_is_taken
     engine = lib.library()
-    if _log_function is None:
-        set_log_function(None)  # a Python program's standard streams are its own
+    if not _log_is_taken:  # a Python program's standard streams are its own
+        if engine.MCSetLogCallback(_log, None) == 0:
+            raise MemoryError
+        _log_is_taken = True
     return engine
 
 
@@ -155,6 +157,10 @@ class _Pictures:
         if shape is None or len(shape) < 2:
             raise ValueError("Pictures without a shape, such as bytes, need size=(width, height).")
         return shape[1], shape[0]
+
+    def release(self) -> None:
+        """The library is done with it. Its table and it hold each other otherwise, and its pictures."""
+        self.table = self._iterator = self._planes = self._keep = None
 
     def _describe(self, _user: Any, form: Any) -> int:
         form[0] = lib.VideoFormat(self.width, self.height, self._rate, self._duration)
@@ -235,6 +241,10 @@ class _Sound:
         self.table = lib.AudioSource(
             c.sizeof(lib.AudioSource), None, lib.GetAudioFormat(failure(self._describe, 0)), lib.Seek(),
             lib.GetBlock(failure(self._give, -1)), lib.Release())
+
+    def release(self) -> None:
+        """As that of pictures."""
+        self.table = self._iterator = self._keep = None
 
     def _describe(self, _user: Any, form: Any) -> int:
         form[0] = lib.AudioFormat(self._rate, self._channels, 16, 0, self._duration)
@@ -367,6 +377,8 @@ def write(
         result = _result_of(handle)
     finally:
         engine.MCDestroy(handle)
+        for source in filter(None, (video, audio)):
+            source.release()
     if failure.error is not None:
         raise failure.error
     if not result.done and not (result.category is Category.CANCELLED and result.files_complete > 0):

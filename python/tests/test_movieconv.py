@@ -1,8 +1,11 @@
 """The package against the library of the build (MOVIECONV_LIBRARY) and its program."""
 
 import errno
+import gc
+import signal
 import subprocess
 import threading
+import weakref
 
 import pytest
 
@@ -142,6 +145,64 @@ def test_leaving_a_conversion_signals_once_and_reads_what_it_still_tells(tmp_pat
         conversion.stop()
     assert conversion.warnings == ["begun"] and conversion._process.returncode == 6
     assert (tmp_path / "movieconv.signals").read_text() == "T"
+
+
+@pytest.mark.parametrize("begun", [False, True])
+def test_stopping_is_no_error_even_before_the_program_listens(tmp_path, monkeypatch, begun):
+    slow = tmp_path / "movieconv"
+    slow.write_text("#!/bin/sh\n" + ("trap 'exit 6' TERM\n" if begun else "") + "echo '{\"event\": \"start\"}'\n"
+                    "while :; do sleep 0.05; done\n")
+    slow.chmod(0o755)
+    monkeypatch.setenv("MOVIECONV_PROGRAM", str(slow))
+    conversion = movieconv.convert("in.mkv", "out.mkv")
+    assert conversion._process.stdout.readline()
+    conversion.stop()
+    conversion.wait()
+    assert conversion._process.returncode == (6 if begun else -signal.SIGTERM)
+
+
+def test_a_failure_that_nobody_read_is_raised_at_the_end_of_with(tmp_path):
+    with pytest.raises(ConversionError, match="in.mp5"):
+        with movieconv.convert(tmp_path / "in.mp5", tmp_path / "x.mkv") as conversion:
+            conversion._process.wait()
+    with pytest.raises(ConversionError, match="in.mp5"):
+        conversion.wait()
+
+
+def test_write_keeps_nothing_of_what_it_was_given(tmp_path):
+    class Given(list):
+        pass
+
+    given = Given(pictures(3))
+    seen = weakref.ref(given)
+    gc.disable()  # what is freed at once needs no collector
+    try:
+        movieconv.write(tmp_path / "out.mp4", given)
+        del given
+        assert seen() is None
+    finally:
+        gc.enable()
+
+
+def test_a_log_function_may_set_another_one_while_others_do(tmp_path):
+    running, others = threading.Event(), threading.Event()
+
+    def log(_level, _line):
+        if not running.is_set():
+            running.set()
+            others.wait(60)
+            movieconv.set_log_function(None)
+
+    movieconv.set_log_function(log)
+    writing = threading.Thread(target=movieconv.write, args=(tmp_path / "out.mp4", pictures(3)), daemon=True)
+    writing.start()
+    assert running.wait(60)
+    setting = threading.Thread(target=movieconv.set_log_function, args=(None,), daemon=True)
+    setting.start()
+    setting.join(60)
+    others.set()
+    writing.join(60)
+    assert not setting.is_alive() and not writing.is_alive()
 
 
 def test_conversions_at_once_know_nothing_of_each_other(tmp_path):

@@ -237,6 +237,28 @@ TEST(ResultTest, PicturesThatTheSoundMovesAreTold) {
     }
 }
 
+TEST(ResultTest, LaterConversionsBeginAtTheStartOfTables) {
+    TableSource source;
+    const MCVideoSource video = source.Video();
+    const MCAudioSource audio = source.Audio();
+    for (const bool withSound : {false, true}) {
+        SCOPED_TRACE(withSound);
+        source.picture = source.block = source.seeks = 0;
+        const MCHandle handle = MCCreateFromSources(&video, withSound ? &audio : nullptr);
+        for (const int seeks : {0, withSound ? 2 : 1}) {
+            recorder::Reset();
+            MCStart(handle, 0.0, 0.0, nullptr, nullptr, nullptr);
+            MCWait(handle, MC_INFINITE);
+            EXPECT_EQ(ResultOf(handle).nCategory, MC_RESULT_DONE) << ResultOf(handle).szWhat;
+            const recorder::Recording recording = recorder::Recorded();
+            ASSERT_EQ(recording.pictures.size(), 10U);
+            EXPECT_EQ(recording.pictures.front().llTime, 0);
+            EXPECT_EQ(source.seeks, seeks);
+        }
+        MCDestroy(handle);
+    }
+}
+
 TEST(ResultTest, RecordsOfOtherSizes) {
     TableSource source;
     const MCVideoSource video = source.Video();

@@ -1,5 +1,5 @@
 // What is foretold to stay behind is what does.
-#include "host/convert/CarryOver.h"
+#include "host/convert/CarryPlan.h"
 #include "host/convert/EncodePlan.h"
 #include "host/convert/Failure.h"
 #include "host/convert/Sources.h"

@@ -1,6 +1,6 @@
 #include "host/window/runner/Foresight.h"
 
-#include "host/convert/CarryOver.h"
+#include "host/convert/CarryPlan.h"
 #include "host/convert/EncodePlan.h"
 #include "host/convert/Failure.h"
 #include "host/convert/Room.h"

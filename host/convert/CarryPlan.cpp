@@ -1,0 +1,228 @@
+#include "host/convert/CarryPlan.h"
+
+#include "host/convert/CarryTexts.h"
+#include "host/convert/Formats.h"
+#include "host/convert/Timecode.h"
+#include "host/source/Languages.h"
+#include "host/source/StreamChoice.h"
+#include "media/FourCC.h"
+#include "media/MediaRecords.h"
+#include "writer/WriterStatus.h"
+
+#include <algorithm>
+#include <cstddef>
+#include <cstdint>
+#include <fmt/format.h>
+#include <utility>
+
+namespace movieconv {
+namespace {
+
+constexpr int64_t kLargestCoverInFlac = 16'000'000; // with its description below 2^24
+
+const StreamInfo& StreamAt(const SourceInfo& source, int index) {
+    return source.streams[static_cast<std::size_t>(index)];
+}
+
+bool IsAmong(const std::vector<int>& list, int number) {
+    return std::count(list.begin(), list.end(), number) > 0;
+}
+
+bool CanBeHeard(const StreamInfo& stream) {
+    return stream.decodable && stream.sound && stream.sound->sampleRate > 0 && stream.sound->channels > 0;
+}
+
+std::string CannotHoldIt(const FileFormatInfo& format) {
+    return fmt::format("{} cannot hold it", ShortName(format));
+}
+
+std::string WhyCoverStays(const StreamInfo& cover, const FileFormatInfo& format) {
+    if ((MWGetFormatTraits(format.fccFormat) & kWriterFormatCover) == 0)
+        return CannotHoldIt(format);
+    return format.fccFormat == FourCC("FLAC") && cover.bytes > kLargestCoverInFlac
+               ? fmt::format("{} cannot hold one of {} bytes", ShortName(format), cover.bytes)
+               : "";
+}
+
+/// Without what is drawn into the pictures, unless it is asked for by name.
+std::vector<int> WantedSubtitles(const SourceInfo& source, const Request& request) {
+    std::vector<int> wanted = WantedTracks(source.streams, StreamKind::kSubtitles, request.subtitles);
+    if (!request.subtitles)
+        wanted.erase(
+            std::remove_if(wanted.begin(), wanted.end(),
+                           [&](int stream) { return std::to_string(stream) == request.burnSubtitles; }),
+            wanted.end());
+    return wanted;
+}
+
+/// What the name of a file of subtitles says of its codec.
+std::string UsualTextCodec(const std::string& path) {
+    const std::size_t dot = path.rfind('.');
+    const std::string extension = dot == std::string::npos ? "" : path.substr(dot + 1);
+    return SameIgnoringCase(extension, "ass") || SameIgnoringCase(extension, "ssa") ? "ass"
+           : SameIgnoringCase(extension, "vtt")                                     ? "webvtt"
+                                                                                    : "subrip";
+}
+
+} // namespace
+
+CarryPlan::CarryPlan(const SourceInfo& source, const Request& request, const FileFormatInfo& format)
+    : source_(source),
+      request_(request),
+      format_(format),
+      sounds_(WantedTracks(source.streams, StreamKind::kSound, request.audioTracks)),
+      subtitles_(WantedSubtitles(source, request)) {
+    if (request.copySound && source.sound && format.bHasAudio != 0)
+        further_.push_back(source.sound->index);
+    for (const int stream : FurtherSound())
+        further_.push_back(stream);
+    for (const int stream : subtitles_)
+        if (WhySubtitlesStay(StreamAt(source, stream), format).empty())
+            further_.push_back(stream);
+}
+
+std::vector<int> CarryPlan::FurtherSound() const {
+    std::vector<int> further;
+    for (const int number : sounds_)
+        if (source_.sound && number != source_.sound->index &&
+            WhySoundStays(StreamAt(source_, number)).empty())
+            further.push_back(number);
+    return further;
+}
+
+bool CarryPlan::Wants(const StreamInfo& stream) const {
+    return stream.kind == StreamKind::kPictures    ? !request_.noVideo
+           : stream.kind == StreamKind::kSound     ? !request_.noAudio && IsAmong(sounds_, stream.index)
+           : stream.kind == StreamKind::kSubtitles ? IsAmong(subtitles_, stream.index)
+                                                   : true;
+}
+
+std::string CarryPlan::WhyItStays(const StreamInfo& stream) const {
+    switch (stream.kind) {
+    case StreamKind::kPictures:
+        if (format_.bHasVideo == 0 || (source_.pictures && source_.pictures->index == stream.index))
+            return {};
+        return source_.pictures ? "one stream of pictures is converted" : "it cannot be decoded";
+    case StreamKind::kSound: {
+        const bool isConverted = source_.sound ? source_.sound->index == stream.index : CanBeHeard(stream);
+        return format_.bHasAudio != 0 && isConverted ? "" : WhySoundStays(stream);
+    }
+    case StreamKind::kSubtitles:
+        return WhySubtitlesStay(stream, format_);
+    case StreamKind::kData:
+        return stream.holdsChapters || HoldsTheTimecode(source_, stream) ? ""
+                                                                         : "data streams are not converted";
+    case StreamKind::kCover:
+        return WhyCoverStays(stream, format_);
+    case StreamKind::kAttachment: {
+        const bool holdsFiles = (MWGetFormatTraits(format_.fccFormat) & kWriterFormatAttachments) != 0;
+        return holdsFiles ? "" : CannotHoldIt(format_);
+    }
+    }
+    return {};
+}
+
+/// Why a stream of sound beside the engine's stays behind; empty when it does not.
+std::string CarryPlan::WhySoundStays(const StreamInfo& stream) const {
+    if (format_.bHasAudio == 0)
+        return CannotHoldIt(format_);
+    if (!HoldsSeveralTracks(format_))
+        return fmt::format("{} holds one track of sound, MKV and MP4 hold several", ShortName(format_));
+    if (!CanBeHeard(stream))
+        return "it cannot be decoded";
+    if (request_.copySound && MWCarriesPackets(format_.fccFormat, stream.codec.c_str()) == 0)
+        return fmt::format("{} cannot hold it as it is", ShortName(format_));
+    if (source_.pictures && !BelongsTo(StreamAt(source_, source_.pictures->index).programs, stream))
+        return "it belongs to another programme";
+    return {};
+}
+
+/// What no output holds of chapters: what FFmpeg does not read, and what has no place in the movie.
+void CarryPlan::AddLostChapters(std::vector<NotCarried>& left) const {
+    if (request_.noChapters)
+        return;
+    const auto tell = [&](std::string reason) {
+        left.push_back({"chapters", std::nullopt, {}, {}, std::move(reason)});
+    };
+    const auto add = [&](int count, const char* what) {
+        if (count > 0)
+            tell(fmt::format("{} of them {}", count, what));
+    };
+    add(source_.unreadChapters, "are in other editions or within others");
+    add(source_.disorderedChapters, "are out of their order in time");
+    add(ChaptersOutside(source_), "lie outside the movie");
+    add(source_.furtherTitles, "have titles in further languages");
+    if (std::string names = FurtherChapterTexts(source_); !names.empty() && !request_.noMetadata)
+        tell(fmt::format("of their texts only the titles are carried, not {}", names));
+}
+
+/// Of the one cover that is carried.
+std::optional<NotCarried> CarryPlan::LostCoverTitle() const {
+    const uint32_t traits = MWGetFormatTraits(format_.fccFormat);
+    const auto cover =
+        std::find_if(source_.streams.begin(), source_.streams.end(),
+                     [](const StreamInfo& stream) { return stream.kind == StreamKind::kCover; });
+    if (cover == source_.streams.end() || cover->title.empty() || request_.noMetadata ||
+        (traits & kWriterFormatCover) == 0 || (traits & kWriterFormatCoverText) != 0)
+        return std::nullopt;
+    return NotCarried{
+        "label", cover->index, cover->codec, {}, fmt::format("{} cannot hold its title", ShortName(format_))};
+}
+
+std::vector<NotCarried> CarryPlan::LostByFormat() const {
+    std::vector<NotCarried> left = LostTexts(source_, request_, format_);
+    if (std::optional<NotCarried> chapters = WhyChaptersStay(source_, request_, format_))
+        left.push_back(*std::move(chapters));
+    else
+        AddLostChapters(left);
+    if (std::optional<NotCarried> timecode = WhyTimecodeStays(source_, request_, format_))
+        left.push_back(*std::move(timecode));
+    for (const int stream : further_)
+        if (std::optional<NotCarried> lost = LostLabel(StreamAt(source_, stream), request_, format_))
+            left.push_back(std::move(*lost));
+    if (std::optional<NotCarried> title = LostCoverTitle())
+        left.push_back(*std::move(title));
+    return left;
+}
+
+std::optional<NotCarried> LostOfFile(const StreamInfo& stream, const Request& request,
+                                     const FileFormatInfo& format) {
+    if (std::string reason = WhySubtitlesStay(stream, format); !reason.empty())
+        return NotCarried{"subtitles", std::nullopt, stream.codec, stream.language, std::move(reason)};
+    return LostLabel(stream, request, format);
+}
+
+std::string WhySubtitlesStay(const StreamInfo& stream, const FileFormatInfo& format) {
+    constexpr uint32_t kMatroska = FourCC("MKV ");
+    if (MWCarriesPackets(format.fccFormat, stream.codec.c_str()) != 0)
+        return {};
+    const bool matroskaCan = MWCarriesPackets(kMatroska, stream.codec.c_str()) != 0;
+    return fmt::format("{} cannot hold them{}", ShortName(format), matroskaCan ? ", MKV can" : "");
+}
+
+NotCarried LeftOf(const StreamInfo& stream, std::string reason) {
+    const std::string& what = stream.codec == "none" ? stream.fileName : stream.codec;
+    const auto number = stream.index >= 0 ? std::optional(stream.index) : std::nullopt; // none: a file's own
+    return {std::string(KindName(stream.kind)), number, what, stream.language, std::move(reason)};
+}
+
+std::vector<NotCarried> ForetellLeftBehind(const SourceInfo& source, const Request& request,
+                                           const FileFormatInfo& format) {
+    const CarryPlan plan(source, request, format);
+    std::vector<NotCarried> left = plan.LostByFormat();
+    for (const SubtitleFileWish& wish : request.subtitleFiles) {
+        StreamInfo stream;
+        stream.kind = StreamKind::kSubtitles;
+        stream.codec = UsualTextCodec(wish.path);
+        stream.language = ThreeLetters(wish.language);
+        if (std::optional<NotCarried> lost = LostOfFile(stream, request, format))
+            left.push_back(std::move(*lost));
+    }
+    for (const StreamInfo& stream : source.streams)
+        if (plan.Wants(stream))
+            if (std::string reason = plan.WhyItStays(stream); !reason.empty())
+                left.push_back(LeftOf(stream, std::move(reason)));
+    return left;
+}
+
+} // namespace movieconv

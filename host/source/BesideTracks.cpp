@@ -1,0 +1,131 @@
+#include "host/source/BesideTracks.h"
+
+#include "host/source/EarlierCues.h"
+#include "host/source/MediaTime.h"
+
+#include <algorithm>
+#include <fmt/format.h>
+#include <utility>
+
+namespace movieconv {
+
+BesideTracks::BesideTracks(Source& source, const SourceChoice& choice, Demuxer& demuxer, Failures& failures)
+    : source_(source), choice_(choice), demuxer_(demuxer), failures_(failures) {}
+
+void BesideTracks::SetBounds(double begin, bool ends, bool isCut) {
+    begin_ = begin;
+    bounds_.begin = ToMediaTime(begin);
+    bounds_.ends = ends;
+    bounds_.isCut = isCut;
+}
+
+BesideSound& BesideTracks::ReadSound(int stream) {
+    const SoundStreamInfo& sound = *source_.Info().streams[static_cast<std::size_t>(stream)].sound;
+    BesideSound& track = Add(stream, std::make_unique<BesideSound>(source_.Reader(), StreamOf(stream), sound,
+                                                                   demuxer_, bounds_, failures_));
+    sounds_.push_back(&track);
+    return track;
+}
+
+BesidePackets& BesideTracks::ReadPackets(int stream) {
+    const bool isPlain = IsPlainText(StreamOf(stream).codecpar->codec_id);
+    const auto toUtf8 = [this, isPlain](AVPacket& packet) {
+        if (isPlain && MakeUtf8(packet))
+            ++cuesInOtherCharset_;
+    };
+    const auto take = [this, stream, toUtf8](int64_t until, bool wait) {
+        Demuxer::Beside taken = demuxer_.TakeBeside(stream, until, wait);
+        if (taken.packet)
+            toUtf8(*taken.packet);
+        return taken;
+    };
+    const auto clock = [this](int64_t stamp, AVRational timeBase) {
+        return source_.Reader().MediaTime(stamp, timeBase);
+    };
+    BesidePackets& track = Add(
+        stream, std::make_unique<BesidePackets>(take, clock, StreamOf(stream).time_base, bounds_, failures_));
+    if (bounds_.begin > 0) {
+        std::vector<av::Packet> earlier = EarlierCues(stream);
+        for (const av::Packet& packet : earlier)
+            toUtf8(*packet);
+        track.Precede(std::move(earlier));
+    }
+    return track;
+}
+
+CopiedSound& BesideTracks::CopySound(int stream) {
+    copied_.push_back(stream);
+    return Add(stream, std::make_unique<CopiedSound>(source_.Reader(), StreamOf(stream), demuxer_, bounds_,
+                                                     failures_));
+}
+
+const AVCodecParameters& BesideTracks::DescribeCopied(CopiedSound& sound) {
+    if (source_.PictureStream() != nullptr || begin_ > 0) // as the decoders are going to
+        demuxer_.Seek(begin_);
+    return sound.Describe();
+}
+
+BesidePackets& BesideTracks::ReadFile(const std::string& path, const std::string& charset,
+                                      const AVStream*& stream) {
+    files_.push_back(std::make_unique<SubtitleFile>(path, charset, source_.Reader().Interruptible()));
+    SubtitleFile& file = *files_.back();
+    stream = &file.Stream();
+    const auto clock = [](int64_t stamp, AVRational timeBase) {
+        return av_rescale_q(stamp, timeBase, {1, kTicksPerSecond});
+    };
+    auto track = std::make_unique<BesidePackets>([&file](int64_t, bool) { return file.Take(); }, clock,
+                                                 stream->time_base, bounds_, failures_);
+    BesidePackets& made = *track;
+    tracks_.push_back(std::move(track));
+    return made;
+}
+
+template <class Track>
+Track& BesideTracks::Add(int stream, std::unique_ptr<Track> track) {
+    streams_.push_back(stream);
+    demuxer_.ReadBeside(streams_);
+    Track& made = *track;
+    tracks_.push_back(std::move(track));
+    return made;
+}
+
+const AVStream& BesideTracks::StreamOf(int stream) const {
+    return *source_.Reader().Context()->streams[stream];
+}
+
+/// Those of all subtitles are read at once.
+std::vector<av::Packet> BesideTracks::EarlierCues(int stream) {
+    if (!std::exchange(earlierCuesRead_, true) && source_.Reader().IsSeekable()) {
+        const SourceInfo& info = source_.Info();
+        std::vector<int> subtitles;
+        for (const StreamInfo& each : info.streams)
+            if (each.kind == StreamKind::kSubtitles)
+                subtitles.push_back(each.index);
+        const int main = info.pictures ? info.pictures->index : info.sound->index;
+        MovieReader again(info.path, choice_.playlists, Growth::kRead, source_.Reader().Interruptible());
+        earlierCues_ = ReadEarlierCues(again, main, std::move(subtitles), bounds_.begin);
+    }
+    return std::move(earlierCues_[stream]);
+}
+
+bool BesideTracks::Copies(int stream) const {
+    return std::find(copied_.begin(), copied_.end(), stream) != copied_.end();
+}
+
+std::vector<std::string> BesideTracks::Complaints() const {
+    std::vector<std::string> texts;
+    if (const int64_t cues = cuesInOtherCharset_; cues > 0)
+        texts.push_back(fmt::format("{} of its subtitles {} not in UTF-8 and taken for Windows-1252", cues,
+                                    cues == 1 ? "was" : "were"));
+    for (const BesideSound* sound : sounds_) {
+        if (sound->Damaged() > 0)
+            texts.push_back(fmt::format("{} damaged pieces of sound data were skipped in stream {}",
+                                        sound->Damaged(), sound->Stream()));
+        if (sound->Corrections() > 0)
+            texts.push_back(fmt::format("the sound of stream {} had {} gaps or overlaps, which were closed",
+                                        sound->Stream(), sound->Corrections()));
+    }
+    return texts;
+}
+
+} // namespace movieconv
