@@ -4,6 +4,7 @@
 
 #include <cstdint>
 
+constexpr double kLowestFrameRate = 0.1;  // that may be asked for; pictures per second
 constexpr double kHighestFrameRate = 200; // pictures per second; of a source with more the engine makes 30
 constexpr int32_t kLargestSide = 32768;   // of a picture, in pixels
 

@@ -165,8 +165,11 @@ std::optional<NotCarried> CarryPlan::LostCoverTitle() const {
     if (cover == source_.streams.end() || cover->title.empty() || request_.noMetadata ||
         (traits & kWriterFormatCover) == 0 || (traits & kWriterFormatCoverText) != 0)
         return std::nullopt;
-    return NotCarried{
-        "label", cover->index, cover->codec, {}, fmt::format("{} cannot hold its title", ShortName(format_))};
+    return NotCarried{"label",
+                      cover->index,
+                      cover->codec,
+                      {},
+                      fmt::format("{} cannot hold its {}", ShortName(format_), "title")};
 }
 
 std::vector<NotCarried> CarryPlan::LostByFormat() const {

@@ -4,6 +4,7 @@
 #include "host/convert/CodecPlan.h"
 #include "host/convert/EncodePlan.h"
 #include "host/convert/Judgement.h"
+#include "host/convert/OutputCheck.h"
 #include "host/convert/Room.h"
 #include "host/convert/SizePlan.h"
 #include "host/convert/SoundLoss.h"
@@ -21,7 +22,9 @@
 #include <cstring>
 #include <filesystem>
 #include <fmt/format.h>
+#include <iterator>
 #include <limits>
+#include <map>
 #include <string_view>
 #include <utility>
 
@@ -150,6 +153,7 @@ bool Course::GoesOn() {
     TakeNews();
     if (outcome_ != kOutcomeCompleted || files_.FirstFailure() || brokenOff_ || !clips_.Next())
         return false;
+    position_ = 0; // of the next clip
     AwaitResume();
     FollowWishes();
     if (userStopped_)
@@ -370,7 +374,23 @@ Verdict Course::Conclude() {
     verdict.bytes = files_.Bytes();
     verdict.files = files_.Complete();
     verdict.damaged = movie_.DamagedPictures();
+    if (verdict.outcome == Outcome::kDone && request_.split)
+        WarnOfOlderClips();
     return verdict;
+}
+
+/// Of clips that were there before, with higher numbers than the new ones.
+void Course::WarnOfOlderClips() {
+    const std::map<int, std::string> clips = ClipsOf(request_.output);
+    const auto first = clips.lower_bound(files_.Opened());
+    const auto count = std::distance(first, clips.end());
+    if (count > 0)
+        observer_.Warned(
+            {Warning::Kind::kLeftover,
+             count == 1
+                 ? fmt::format("\"{}\" of an earlier conversion stays beside the new clips", first->second)
+                 : fmt::format("\"{}\" to \"{}\" of an earlier conversion stay beside the new clips",
+                               first->second, clips.rbegin()->second)});
 }
 
 /// Why the source ended before what it promises, and before the length that was asked for; empty when it did

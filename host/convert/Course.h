@@ -80,6 +80,7 @@ private:
     double Reached() const;
     std::string WhyItEndedEarly() const;
     void ReportComplaints();
+    void WarnOfOlderClips();
 
     const Request request_; // with rates by the greatest size
     Movie& movie_;
@@ -91,7 +92,7 @@ private:
     FileLedger files_;
     Engine engine_;
     std::vector<SubtitleTrack> subtitles_; // that are in the output
-    double earlier_ = 0;                        // seconds, in the clips that are there
+    double earlier_ = 0;                   // seconds, in the clips that are there
 
     // The engine's worker sets these.
     std::atomic<double> position_{0}; // in the clip, in seconds

@@ -113,9 +113,10 @@ std::optional<double> ParseFrameRate(std::string_view text) {
     const auto number = ParseNumber(text.substr(0, slash));
     const auto divisor =
         slash == std::string_view::npos ? std::optional(1.0) : ParseNumber(text.substr(slash + 1));
-    if (!number || !divisor || *divisor <= 0 || *number <= 0 || *number / *divisor > kHighestFrameRate)
+    if (!number || !divisor || *divisor <= 0)
         return std::nullopt;
-    return *number / *divisor;
+    const double rate = *number / *divisor;
+    return rate >= kLowestFrameRate && rate <= kHighestFrameRate ? std::optional(rate) : std::nullopt;
 }
 
 } // namespace movieconv

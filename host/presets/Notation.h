@@ -29,7 +29,7 @@ std::optional<int64_t> ParseBytes(std::string_view text);
 /// From "640x360", both from 2 to kLargestSide. Nothing for anything else.
 std::optional<Size> ParseSize(std::string_view text);
 
-/// Pictures per second from "25", "23.976" or "30000/1001", up to 200. Nothing for anything else.
+/// Pictures per second from "25", "23.976" or "30000/1001", from 0.1 to 200. Nothing for anything else.
 std::optional<double> ParseFrameRate(std::string_view text);
 
 /// From "T:B:L:R", each up to 32768. Nothing for anything else.

@@ -107,9 +107,7 @@ Json Object(const StreamInfo& stream) {
 } // namespace
 
 std::string DescribeAsJson(const SourceInfo& source) {
-    Json object{{"v", JsonReporter::kVersion},
-                {"event", "info"},
-                {"path", source.path},
+    Json object{{"path", source.path},
                 {"container", source.container},
                 {"bytes", source.bytes},
                 {"length_s", source.certainty == Certainty::kGuessed ? Json(nullptr) : Json(source.duration)},
@@ -127,7 +125,19 @@ std::string DescribeAsJson(const SourceInfo& source) {
                                       {"tags", TagsOf(chapter.tags)}});
     }
     object["tags"] = TagsOf(source.tags);
-    return EscapeCommands(object.dump(-1, ' ', false, Json::error_handler_t::replace)) + "\n";
+    return JsonLine("info", object);
+}
+
+std::string EstimateAsJson(const Room& room) {
+    const auto known = [](int64_t bytes) { return bytes < 0 ? Json(nullptr) : Json(bytes); };
+    return JsonLine("estimate", {{"length_s", room.length},
+                                 {"needed", known(room.needed)},
+                                 {"folder", room.folder},
+                                 {"free", known(room.free)}});
+}
+
+std::string PlanAsJson(const std::string& path, int pieces) {
+    return JsonLine("plan", {{"path", path}, {"pieces", pieces}});
 }
 
 } // namespace movieconv

@@ -5,6 +5,7 @@
 
 #include <cmath>
 #include <fmt/format.h>
+#include <nlohmann/json.hpp>
 
 namespace movieconv {
 namespace {
@@ -59,6 +60,13 @@ std::string JsonString(std::string_view bytes) {
         }
     }
     return EscapeCommands(quoted + '"');
+}
+
+std::string JsonLine(std::string_view event, const nlohmann::ordered_json& fields) {
+    using Json = nlohmann::ordered_json;
+    Json object{{"v", JsonReporter::kVersion}, {"event", event}};
+    object.update(fields);
+    return EscapeCommands(object.dump(-1, ' ', false, Json::error_handler_t::replace)) + "\n";
 }
 
 void JsonReporter::Print(std::string_view event, const std::string& fields) const {

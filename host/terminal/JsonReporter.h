@@ -4,6 +4,7 @@
 
 #include "host/terminal/Reporter.h"
 
+#include <nlohmann/json_fwd.hpp>
 #include <string>
 #include <string_view>
 
@@ -38,6 +39,9 @@ std::string EscapeCommands(std::string_view json);
 
 /// A JSON string with its quotes. Bytes that are not UTF-8 become U+FFFD.
 std::string JsonString(std::string_view bytes);
+
+/// An object of the stream with these fields, and the line's end.
+std::string JsonLine(std::string_view event, const nlohmann::ordered_json& fields);
 
 } // namespace movieconv
 

@@ -2,6 +2,7 @@
 
 #include "host/convert/Formats.h"
 #include "host/presets/Preset.h"
+#include "host/terminal/JsonReporter.h"
 #include "media/MediaWriter.h"
 #include "text/Printable.h"
 
@@ -13,6 +14,8 @@
 
 namespace movieconv {
 namespace {
+
+using Json = nlohmann::ordered_json;
 
 /// Calls `take` with each file format.
 template <class Take>
@@ -63,7 +66,7 @@ std::string FormatsText() {
 }
 
 std::string FormatsJson() {
-    nlohmann::ordered_json list = nlohmann::ordered_json::array();
+    Json list = Json::array();
     ForEachFormat([&](const FileFormatInfo& format) {
         list.push_back({{"code", CodeName(format.fccFormat)},
                         {"name", format.szName},
@@ -71,7 +74,7 @@ std::string FormatsJson() {
                         {"pictures", Codecs(format.fccVideoCodecs)},
                         {"sound", Codecs(format.fccAudioCodecs)}});
     });
-    return nlohmann::ordered_json{{"v", 1}, {"event", "formats"}, {"formats", list}}.dump() + "\n";
+    return JsonLine("formats", {{"formats", list}});
 }
 
 std::string PresetsText() {
@@ -85,6 +88,17 @@ std::string PresetsText() {
                            : fmt::format(" ({})", text::Printable(preset.path)));
     }
     return text;
+}
+
+std::string PresetsJson() {
+    Json list = Json::array();
+    const auto given = [](const std::string& text) { return text.empty() ? Json(nullptr) : Json(text); };
+    for (const PresetSummary& preset : ListPresets())
+        list.push_back({{"name", preset.name},
+                        {"description", preset.description},
+                        {"path", given(preset.path)},
+                        {"failure", given(preset.failure)}});
+    return JsonLine("presets", {{"presets", list}});
 }
 
 std::string PresetNames() {

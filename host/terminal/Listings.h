@@ -13,8 +13,9 @@ std::string FormatsText();
 /// The same as one JSON object in a line; docs/progress-json.md describes it.
 std::string FormatsJson();
 
-/// The presets with what they say of themselves, for people.
+/// The presets with what they say of themselves, for people; as one JSON object in a line.
 std::string PresetsText();
+std::string PresetsJson();
 
 /// Their names, one a line.
 std::string PresetNames();

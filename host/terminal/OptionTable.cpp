@@ -77,7 +77,8 @@ void AddPictures(CLI::App& app, Options& options) {
     group.Choice<int>("--depth", request.depth, {{"8", 8}, {"10", 10}},
                       "Bits of a colour; by default the source's, as far as\nthe codec has them");
     group.Parsed("--frame-rate", "N", ParseFrameRate, request.frameRate,
-                 fmt::format("a frame rate up to {}, such as 25 or 30000/1001", kHighestFrameRate),
+                 fmt::format("a frame rate from {} to {}, such as 25 or 30000/1001", kLowestFrameRate,
+                             kHighestFrameRate),
                  "Pictures per second, steadily; by default the source's times");
     group.Parsed("--quality", "N", ParseNumber, request.quality, "a number such as 23 or 23.5",
                  "Constant quality on the codec's scale, less is better;\nby default the preset's");

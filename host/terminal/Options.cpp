@@ -9,6 +9,7 @@
 #include "host/terminal/TaskChecks.h"
 
 #include <CLI/CLI.hpp>
+#include <algorithm>
 #include <cerrno>
 #include <chrono>
 #include <cstdio>
@@ -16,7 +17,9 @@
 #include <cstring>
 #include <fmt/format.h>
 #include <iostream>
+#include <string>
 #include <utility>
+#include <vector>
 
 namespace movieconv {
 namespace {
@@ -55,6 +58,17 @@ std::string Version() {
     return text;
 }
 
+/// The parser takes "[a, b]" for a list where several names may stand; as "./[a, b]" it is the same file.
+std::vector<std::string> NotTornApart(std::vector<std::string> arguments) {
+    bool isText = false;
+    for (std::string& argument : arguments) {
+        if (!isText && argument.size() > 1 && argument.front() == '[' && argument.back() == ']')
+            argument.insert(0, "./");
+        isText = argument == "--metadata";
+    }
+    return arguments;
+}
+
 void RequirePrinted() {
     if (!std::cout.flush() || std::fflush(stdout) != 0 || std::ferror(stdout) != 0)
         throw Failure(Category::kOutput,
@@ -77,7 +91,9 @@ std::optional<Options> ParseOptions(int argc, char** argv) {
         ->group(heading::kInsteadOfConverting);
     AddOptions(app, options);
     try {
-        app.parse(argc, argv);
+        std::vector<std::string> arguments = NotTornApart({argv + std::min(argc, 1), argv + argc});
+        std::reverse(arguments.begin(), arguments.end()); // as the parser takes them
+        app.parse(std::move(arguments));
     } catch (const CLI::Success& asked) {
         app.exit(asked);
         RequirePrinted();
@@ -92,7 +108,7 @@ std::optional<Options> ParseOptions(int argc, char** argv) {
         return std::nullopt;
     }
     if (options.request.input == "-")
-        options.request.input = "/dev/stdin";
+        options.request.input = kStandardInput;
     CheckOptions(options);
     if (NeedsOutput(options.task))
         ApplyPreset(options);

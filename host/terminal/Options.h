@@ -13,6 +13,8 @@
 
 namespace movieconv {
 
+constexpr const char* kStandardInput = "/dev/stdin"; // what "-" stands for as an input
+
 enum class Task { kConvert, kPlan, kPiece, kJoin, kInfo, kEstimate, kListFormats, kListPresets, kShowPreset };
 enum class ProgressStyle { kBar, kJson, kNone };
 

@@ -1,4 +1,5 @@
 #include "host/convert/Amounts.h"
+#include "host/convert/OutputCheck.h"
 #include "host/convert/Room.h"
 #include "host/convert/Sources.h"
 #include "host/pieces/Plan.h"
@@ -74,21 +75,26 @@ void PrintWhole(const StandardStreams& streams, const std::string& text) {
     }
 }
 
+std::string TellNeeded(const Room& room) {
+    return room.needed < 0
+               ? fmt::format("how much {} of output need is unknown: the quality decides, not a rate;\n"
+                             "the conversion tells it after its first ten seconds\n",
+                             FormatTime(room.length, true))
+               : fmt::format("needs about {} for {} of output\n", FormatBytes(room.needed),
+                             FormatTime(room.length, true));
+}
+
 ExitCode Estimate(const Options& options, const StandardStreams& streams) {
     const Room room = EstimateRoom(options.request);
-    PrintWhole(streams,
-               room.needed < 0
-                   ? fmt::format("how much {} of output need is unknown: the quality decides, not a rate;\n"
-                                 "the conversion tells it after its first ten seconds\n",
-                                 FormatTime(room.length, true))
-                   : fmt::format("needs about {} for {} of output\n", FormatBytes(room.needed),
-                                 FormatTime(room.length, true)));
+    const bool asJson = options.progress == ProgressStyle::kJson;
+    PrintWhole(streams, asJson ? EstimateAsJson(room) : TellNeeded(room));
     if (room.free < 0) {
         throw Failure(Category::kOutput,
                       fmt::format("the output's folder \"{}\" cannot be used", room.folder));
     }
-    PrintWhole(streams,
-               fmt::format("{} are free in \"{}\"\n", FormatBytes(room.free), text::Printable(room.folder)));
+    if (!asJson)
+        PrintWhole(streams, fmt::format("{} are free in \"{}\"\n", FormatBytes(room.free),
+                                        text::Printable(room.folder)));
     return room.needed <= room.free ? ExitCode::kDone : ExitCode::kNoSpace;
 }
 
@@ -113,6 +119,9 @@ std::optional<Plan> PlanThere(const std::string& path, const Plan& begun) {
 
 ExitCode WriteNewPlan(const Options& options, const StandardStreams& streams) {
     const std::string& path = *options.plan;
+    if (options.request.input == kStandardInput)
+        throw Failure(Category::kRequest, "whoever makes the pieces cannot read this standard input");
+    CheckOutput(options.request); // before all is made that cannot be joined
     Plan begun = BeginPlan(options.request, options.division);
     std::optional<Plan> plan = options.request.overwrite ? std::nullopt : PlanThere(path, begun);
     if (!plan) {
@@ -125,9 +134,12 @@ ExitCode WriteNewPlan(const Options& options, const StandardStreams& streams) {
         streams.PrintError(fmt::format("movieconv: warning: {}", complaint));
     if (const std::string cost = TellBitRate(*plan); !cost.empty())
         streams.PrintError(fmt::format("movieconv: warning: {}", cost));
-    PrintWhole(streams, fmt::format("{}: pieces 0 to {}, the last one is the sound and whatever else is "
-                                    "carried\n",
-                                    text::Printable(path), plan->Pieces() - 1));
+    PrintWhole(streams,
+               options.progress == ProgressStyle::kJson
+                   ? PlanAsJson(path, plan->Pieces())
+                   : fmt::format("{}: pieces 0 to {}, the last one is the sound and whatever else is "
+                                 "carried\n",
+                                 text::Printable(path), plan->Pieces() - 1));
     return ExitCode::kDone;
 }
 
@@ -150,7 +162,9 @@ ExitCode Perform(const Options& options, const StandardStreams& streams, MainLoo
         PrintWhole(streams, options.progress == ProgressStyle::kJson ? FormatsJson() : FormatsText());
         return ExitCode::kDone;
     case Task::kListPresets:
-        PrintWhole(streams, options.quiet ? PresetNames() : PresetsText());
+        PrintWhole(streams, options.progress == ProgressStyle::kJson ? PresetsJson()
+                            : options.quiet                          ? PresetNames()
+                                                                     : PresetsText());
         return ExitCode::kDone;
     case Task::kShowPreset:
         PrintWhole(streams, ShowPreset(options.preset, streams) + "\n");

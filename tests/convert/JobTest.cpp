@@ -228,6 +228,48 @@ TEST(Job, IsNoSuccessWhenAClipVanishesOrIsAnother) {
     }
 }
 
+TEST(Job, TellsClipsOfAnotherDivisionThatStay) {
+    const Folder folder;
+    Request request = Converting(CountedMovie(), folder / "movie.mkv");
+    request.split = 1;
+    Listener first;
+    ASSERT_EQ(Convert(request, first).outcome, Outcome::kDone);
+    request.overwrite = true;
+    for (const double length : {1.0, 1.5, 2.0}) {
+        SCOPED_TRACE(length);
+        request.split = length;
+        Listener listener;
+        const Verdict verdict = Convert(request, listener);
+        EXPECT_EQ(verdict.outcome, Outcome::kDone) << TextOf(verdict);
+        const std::size_t left = 4 - listener.closed.size();
+        ASSERT_EQ(listener.warnings.size(), left > 0 ? 1u : 0u);
+        if (left == 0)
+            continue;
+        const std::string last = '"' + (folder / "movie_03.mkv") + "\" of an earlier conversion stay";
+        EXPECT_EQ(listener.warnings[0].text.find(
+                      left == 1 ? last : '"' + (folder / "movie_02.mkv") + "\" to " + last),
+                  0u)
+            << listener.warnings[0].text;
+    }
+}
+
+TEST(Job, TellsNoMoreThanItsClipsHoldWhenItIsStoppedBetweenTwo) {
+    const Folder folder;
+    Request request = Converting(CountedMovie(), folder / "movie.mkv");
+    request.split = 1;
+    Listener listener;
+    movieconv::Job job(request, listener);
+    double held = 0;
+    listener.onClosed = [&](const movieconv::ClosedFile& news) {
+        held += news.videoSeconds;
+        job.Stop();
+    };
+    job.Start();
+    job.Wait();
+    EXPECT_EQ(job.Result()->outcome, Outcome::kStopped);
+    EXPECT_NEAR(job.Result()->position, held, 0.2);
+}
+
 // On a disk that is smaller than any reserve one could ask for.
 TEST(Job, WaitsForAsMuchRoomAsItNeeds) {
     const Folder folder;

@@ -14,6 +14,7 @@ class Listener final : public movieconv::Observer {
 public:
     std::function<void(const movieconv::Progress&)> onProgress;
     std::function<void(const movieconv::OpenedFile&)> onOpened;
+    std::function<void(const movieconv::ClosedFile&)> onClosed;
 
     int starts = 0;
     int ends = 0;
@@ -44,6 +45,8 @@ public:
     }
     void Closed(const movieconv::ClosedFile& news) override {
         closed.push_back(news.path);
+        if (onClosed)
+            onClosed(news);
         Note();
     }
     void Warned(const movieconv::Warning& news) override {

@@ -32,7 +32,7 @@ TEST(Notation, ReadRatesSizesAndFrameRates) {
          {"", "1:2:3", "1:2:3:", "1:2:3:4:", "1:2:3:4:5", "-1:2:3:4", "1:a:3:4", "1:2:3:99999"})
         EXPECT_FALSE(ParseCrop(text)) << text;
     EXPECT_DOUBLE_EQ(*ParseFrameRate("30000/1001"), 30000.0 / 1001);
-    for (const char* text : {"0", "25/0", "1000", "/5", "a"})
+    for (const char* text : {"0", "25/0", "1000", "0.0001", "1/60", "/5", "a"})
         EXPECT_EQ(ParseFrameRate(text), std::nullopt) << text;
 }
 

@@ -22,6 +22,13 @@ using program::Call;
 using program::Result;
 using program::Running;
 
+TEST(Program, TakesANameInBracketsForOneName) {
+    const Folder folder;
+    const Result result = Call({"--into", folder / "out", folder / "a.mkv", folder / "b.mkv", "[c, d]"});
+    EXPECT_EQ(result.code, 3) << result.err;
+    EXPECT_NE(result.err.find("\"./[c, d]\""), std::string::npos) << result.err;
+}
+
 TEST(Program, RefusesAndLeavesEverythingAsItWas) {
     const Folder folder;
     const std::string source = folder / "in.mkv";
@@ -59,6 +66,10 @@ TEST(Program, RefusesAndLeavesEverythingAsItWas) {
         {{"--plan", source, source, folder / "out.mkv", "-y"}, 2, "is the source"},
         {{"--plan", folder / "same.mkv", source, folder / "out.mkv", "-y"}, 2, "is the source"},
         {{"--plan", folder / "there.mp4", source, folder / "there.mp4", "-y"}, 2, "is the output"},
+        {{"--plan", folder / "p", source, source}, 2, "is the source itself"},
+        {{"--plan", folder / "p", source, folder / "there.mp4"}, 4, "--overwrite"},
+        {{"--plan", folder / "p", source, folder / "nowhere/out.mp4"}, 4, "nowhere"},
+        {{"--plan", folder / "p", "-", folder / "out.mp4"}, 2, "standard input"},
         {{"--into", folder / "out", source, folder / "body.mp4", folder / "same.mkv", "--log", source, "-y"},
          2,
          "is the source"},
@@ -94,7 +105,7 @@ TEST(Program, RefusesAndLeavesEverythingAsItWas) {
         {{"none.mkv", folder / "out.webm", "--video-codec", "XVID"}, 2, "cannot carry pictures as \"XVID\""},
         {{source, folder / "out.mp4", "--video-codec", "H.264"}, 2, "four characters"},
         {{source, folder / "out.mp4", "--no-video", "--no-audio"}, 2, "--no-audio"},
-        {{source, folder / "out.mp4", "--frame-rate", "240"}, 2, "up to 200"},
+        {{source, folder / "out.mp4", "--frame-rate", "240"}, 2, "to 200"},
         {{source, folder / "out.mp4", "--quality", "best"}, 2, "\"best\" is not a number such as 23"},
         {{source, folder / "out.mp4", "--channels", "9"}, 2, "\"9\" is not a whole number from 1 to 8"},
         {{"--piece", "x", source}, 2, "\"x\" is not a whole number from 0 to 10000"},

@@ -199,6 +199,8 @@ constexpr const char* kSentences[] = {
     QT_TRANSLATE_NOOP("Library", "the sound of stream %1 had %2 gaps or overlaps, which were closed"),
     QT_TRANSLATE_NOOP("Library", "pictures of %1 s, which the source announces only at %2 s, were left out"),
     QT_TRANSLATE_NOOP("Library", "sound of %1 s, which the source announces only at %2 s, was left out"),
+    QT_TRANSLATE_NOOP("Library", "“%1” of an earlier conversion stays beside the new clips"),
+    QT_TRANSLATE_NOOP("Library", "“%1” to “%2” of an earlier conversion stay beside the new clips"),
 
     // What is wrong with a preset.
     QT_TRANSLATE_NOOP("Library", "%1: the parent “%2” has this preset as a parent itself"),
@@ -220,7 +222,7 @@ constexpr const char* kSentences[] = {
     QT_TRANSLATE_NOOP("Library", "a number from 0 to 63, or such numbers by picture height or codec"),
     QT_TRANSLATE_NOOP("Library", "a bit rate such as “%1”, or such rates by number of channels"),
     QT_TRANSLATE_NOOP("Library", "a bit rate such as “%1”"),
-    QT_TRANSLATE_NOOP("Library", "a frame rate up to %1, such as 25 or “%2”"),
+    QT_TRANSLATE_NOOP("Library", "a frame rate from %1 to %2, such as 25 or “%3”"),
     QT_TRANSLATE_NOOP("Library", "slowest, slower, slow, medium, fast, faster or fastest"),
     QT_TRANSLATE_NOOP("Library", "baseline, main or high"),
     QT_TRANSLATE_NOOP("Library", "a size such as “%1”"), QT_TRANSLATE_NOOP("Library", "true or false"),

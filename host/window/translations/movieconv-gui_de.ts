@@ -1106,8 +1106,16 @@
         <translation>eine Bitrate wie „%1“</translation>
     </message>
     <message>
-        <source>a frame rate up to %1, such as 25 or “%2”</source>
-        <translation>eine Bildrate bis %1, etwa 25 oder „%2“</translation>
+        <source>“%1” of an earlier conversion stays beside the new clips</source>
+        <translation>„%1“ aus einer früheren Umwandlung bleibt neben den neuen Clips</translation>
+    </message>
+    <message>
+        <source>“%1” to “%2” of an earlier conversion stay beside the new clips</source>
+        <translation>„%1“ bis „%2“ aus einer früheren Umwandlung bleiben neben den neuen Clips</translation>
+    </message>
+    <message>
+        <source>a frame rate from %1 to %2, such as 25 or “%3”</source>
+        <translation>eine Bildrate von %1 bis %2, etwa 25 oder „%3“</translation>
     </message>
     <message>
         <source>slowest, slower, slow, medium, fast, faster or fastest</source>
