@@ -93,10 +93,10 @@ const AVStream& BesideTracks::StreamOf(int stream) const {
     return *source_.Reader().Context()->streams[stream];
 }
 
-/// Those of all subtitles are read at once.
+/// Those of all subtitles are read at once. A source that cannot be sought is read from its start, with them.
 std::vector<av::Packet> BesideTracks::EarlierCues(int stream) {
-    if (!std::exchange(earlierCuesRead_, true) && source_.Reader().IsSeekable()) {
-        const SourceInfo& info = source_.Info();
+    const SourceInfo& info = source_.Info();
+    if (!std::exchange(earlierCuesRead_, true) && source_.Reader().IsSeekable() && !info.clockRestarts) {
         std::vector<int> subtitles;
         for (const StreamInfo& each : info.streams)
             if (each.kind == StreamKind::kSubtitles)

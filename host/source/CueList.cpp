@@ -1,6 +1,7 @@
 #include "host/source/CueList.h"
 
 #include "host/source/MediaTime.h"
+#include "host/source/PacketClock.h"
 #include "host/source/PacketTime.h"
 #include "host/source/SourceError.h"
 #include "host/source/StreamChoice.h"
@@ -39,7 +40,9 @@ void ReadStream(CueList& list, const Source& source, const BurnWish& wish, bool 
     CheckDecodable(*found.codecpar, wish);
     list.parameters = av::CopyOf(*found.codecpar);
     reader.Select({stream});
-    if (wish.begin > kFarthest) {
+    PacketClock clock(source.Info(), *context);
+    reader.SelectBeside(clock.Witnesses());
+    if (wish.begin > kFarthest && !source.Info().clockRestarts) {
         const int64_t from = reader.Start() + wish.begin - kFarthest;
         const int64_t target = av_rescale_q(from, {1, kTicksPerSecond}, av_get_time_base_q());
         if (avformat_seek_file(context, -1, INT64_MIN, target, target, 0) < 0 && !reader.Rewind())
@@ -49,9 +52,10 @@ void ReadStream(CueList& list, const Source& source, const BurnWish& wish, bool 
         av::Packet packet = av::NewPacket();
         const int result = av_read_frame(context, packet.get());
         av::CheckMemory(result);
-        const int64_t stamp = StampOf(*packet);
         if (result < 0)
             return;
+        clock.Repair(reader, *packet);
+        const int64_t stamp = StampOf(*packet);
         if (packet->stream_index != stream || stamp == AV_NOPTS_VALUE)
             continue;
         if (IsPlainText(found.codecpar->codec_id))

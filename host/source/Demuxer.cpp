@@ -2,7 +2,6 @@
 
 #include "host/source/MediaTime.h"
 #include "host/source/PacketTime.h"
-#include "host/source/StreamChoice.h"
 
 #include <algorithm>
 #include <limits>
@@ -15,33 +14,15 @@ constexpr std::size_t kEnoughPackets = 32;
 constexpr std::size_t kEnoughBytes = 1 << 20;
 constexpr int kToleratedFailures = 100; // reads in a row that may fail on damaged data
 
-/// Whether the clock of such a source may start anew.
-bool MayJump(const AVFormatContext& context) {
-    return (context.iformat->flags & AVFMT_TS_DISCONT) != 0;
-}
-
-/// All pictures and sound on the clock of what is converted, where that may jump: whatever is converted of
-/// them, the same jumps are found.
-std::vector<int> WitnessesIn(const SourceInfo& info, const AVFormatContext& context) {
-    std::vector<int> witnesses;
-    const int converted = info.pictures ? info.pictures->index : info.sound->index;
-    const std::vector<int>& programs = info.streams[static_cast<std::size_t>(converted)].programs;
-    for (const StreamInfo& stream : info.streams)
-        if (MayJump(context) && BelongsTo(programs, stream) &&
-            (stream.kind == StreamKind::kPictures || stream.kind == StreamKind::kSound))
-            witnesses.push_back(stream.index);
-    return witnesses;
-}
-
 } // namespace
 
 Demuxer::Demuxer(Source& source, Failures& failures)
     : source_(source),
       failures_(failures),
-      witnesses_(WitnessesIn(source.Info(), *source.Reader().Context())),
       seeker_(source),
+      clock_(source.Info(), *source.Reader().Context()),
       late_(source.Info().streams.size()) {
-    source_.Reader().SelectBeside(witnesses_);
+    source_.Reader().SelectBeside(clock_.Witnesses());
     if (const auto& pictures = source.Info().pictures)
         queues_.For({pictures->index});
     if (const auto& sound = source.Info().sound)
@@ -49,7 +30,7 @@ Demuxer::Demuxer(Source& source, Failures& failures)
 }
 
 void Demuxer::ReadBeside(const std::vector<int>& streams) {
-    std::vector<int> read = witnesses_;
+    std::vector<int> read = clock_.Witnesses();
     read.insert(read.end(), streams.begin(), streams.end());
     source_.Reader().SelectBeside(read);
     for (const int stream : streams)
@@ -162,11 +143,6 @@ std::optional<int64_t> Demuxer::EndOf(int stream) const {
     return queues_.EndOf(stream);
 }
 
-int Demuxer::ClockJumps() const {
-    const std::lock_guard lock(mutex_);
-    return clock_.Jumps();
-}
-
 std::vector<LateStreams::Left> Demuxer::LeftOut() const {
     const std::lock_guard lock(mutex_);
     return late_.AllLeft();
@@ -228,7 +204,7 @@ void Demuxer::GiveOut(av::Packet packet) {
     const int replaced = isTaken ? -1 : late_.Replaced(context, stream);
     if (replaced >= 0 && AreAlike(*context.streams[replaced], *context.streams[stream]))
         packet->stream_index = replaced;
-    RepairClock(*packet);
+    clock_.Repair(source_.Reader(), *packet);
     {
         const std::optional<int64_t> end = EndOf(*packet);
         const AVRational unit = context.streams[packet->stream_index]->time_base;
@@ -247,28 +223,6 @@ std::optional<int64_t> Demuxer::EndOf(const AVPacket& packet) const {
         return std::nullopt;
     return source_.Reader().MediaTime(EndStampOf(packet),
                                       source_.Reader().Context()->streams[packet.stream_index]->time_base);
-}
-
-void Demuxer::RepairClock(AVPacket& packet) {
-    if (!MayJump(*source_.Reader().Context()) || packet.dts == AV_NOPTS_VALUE)
-        return;
-    const AVStream* stream = source_.Reader().Context()->streams[packet.stream_index];
-    const AVRational mediaBase{1, kTicksPerSecond};
-    constexpr int64_t kLongest = 3600 * kTicksPerSecond; // damaged data can tell anything
-    const int64_t length =
-        std::clamp<int64_t>(av_rescale_q(packet.duration, stream->time_base, mediaBase), 0, kLongest);
-    const int64_t stamp = source_.Reader().MediaTime(packet.dts, stream->time_base);
-    int64_t shift = 0;
-    {
-        const std::lock_guard lock(mutex_);
-        shift = stream->codecpar->codec_type == AVMEDIA_TYPE_SUBTITLE
-                    ? clock_.Shift()
-                    : clock_.ShiftFor(packet.stream_index, stamp, length);
-    }
-    const int64_t ticks = av_rescale_q(shift, mediaBase, stream->time_base);
-    packet.dts += ticks;
-    if (packet.pts != AV_NOPTS_VALUE)
-        packet.pts += ticks;
 }
 
 } // namespace movieconv

@@ -7,10 +7,10 @@
 #ifndef MOVIECONV_HOST_SOURCE_DEMUXER_H
 #define MOVIECONV_HOST_SOURCE_DEMUXER_H
 
-#include "host/source/ClockRepair.h"
 #include "host/source/Failures.h"
 #include "host/source/KeySeeker.h"
 #include "host/source/LateStreams.h"
+#include "host/source/PacketClock.h"
 #include "host/source/PacketQueues.h"
 #include "host/source/Source.h"
 #include "thread/Stall.h"
@@ -76,7 +76,7 @@ public:
     std::size_t Bytes() const;
 
     /// Times that the source's clock jumped and was put right.
-    int ClockJumps() const;
+    int ClockJumps() const { return clock_.Jumps(); }
 
     /// Streams of pictures and sound that came up while reading and were left out.
     std::vector<LateStreams::Left> LeftOut() const;
@@ -93,12 +93,10 @@ private:
     bool AwaitDemand();
     bool ReadOne();
     void GiveOut(av::Packet packet);
-    void RepairClock(AVPacket& packet);
     std::optional<int64_t> EndOf(const AVPacket& packet) const;
 
     Source& source_;
     Failures& failures_;
-    const std::vector<int> witnesses_; // read for the clock alone, unless they are taken too
     KeySeeker seeker_;
     double soughtSeconds_ = -1;
     bool soughtWell_ = false;
@@ -110,7 +108,7 @@ private:
     bool started_ = false;
     bool stopping_ = false;
     bool ended_ = false;
-    ClockRepair clock_; // changed by the reading thread alone
+    PacketClock clock_; // changed by the reading thread alone
     LateStreams late_;  // likewise
 
     int failedReads_ = 0;

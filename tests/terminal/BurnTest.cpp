@@ -130,6 +130,29 @@ TEST(Burn, FollowsRangesClipsCroppingAndScaling) {
 
 /// A stream of small pictures goes on with larger ones, wider ones, and those of pixels that are wider
 /// instead.
+TEST(Burn, GoesOnBehindJumpsOfTheClock) {
+    const Folder folder;
+    WriteFile(folder / "bits.sup", whole_movie::BitmapSubtitles({{1.2, 2}}));
+    Ffmpeg(Join(Lavfi("color=black:r=10:d=3:s=160x120"),
+                Args{"-copyts", "-i", folder / "bits.sup", "-map", "0", "-map", "1", "-c:v", "mpeg2video",
+                     "-c:s", "dvbsub", folder / "part.mkv"}));
+    Ffmpeg(
+        {"-i", folder / "part.mkv", "-map", "0", "-c", "copy", folder / "part.ts"}); // in the order of time
+    const std::string part = ReadFile(folder / "part.ts");
+    WriteFile(folder / "joined.ts", part + part + part);
+    std::vector<std::string> lines;
+    for (const char* begin : {"0", "3"}) {
+        const Result made = Call({"-q", folder / "joined.ts", folder / "o.mkv", "-y", "--begin", begin,
+                                  "--burn-subtitles", "1", "--video-codec", "FFV1"});
+        ASSERT_EQ(made.code, 0) << made.err;
+        lines.push_back(Timeline(BoxesOf(folder / "o.mkv", 160, 120)));
+    }
+    const std::string first = lines[0].substr(0, 30);
+    EXPECT_NEAR(static_cast<double>(std::count(first.begin(), first.end(), '#')), 12, 5) << first;
+    EXPECT_EQ(lines[0], first + first + first);
+    EXPECT_EQ(lines[1], first + first);
+}
+
 TEST(Burn, StaysInItsPlaceWhenThePicturesChangeTheirSize) {
     const Folder folder;
     const struct {
