@@ -101,8 +101,9 @@ PresetFacts ScriptedRunner::LoadPreset(const std::string& path) {
     return Presets().back();
 }
 
-void ScriptedRunner::SavePreset(const std::string& path, const Wishes& wishes) {
+QStringList ScriptedRunner::SavePreset(const std::string& path, const Wishes& wishes) {
     saved[path] = wishes;
+    return unkept;
 }
 
 std::unique_ptr<Run> ScriptedRunner::Start(const Order& order, std::shared_ptr<RunListener> listener) {

@@ -198,8 +198,8 @@ PresetFacts ConvertRunner::LoadPreset(const std::string& path) {
     }
 }
 
-void ConvertRunner::SavePreset(const std::string& path, const Wishes& wishes) {
-    WritePreset(path, wishes);
+QStringList ConvertRunner::SavePreset(const std::string& path, const Wishes& wishes) {
+    return WritePreset(path, wishes);
 }
 
 std::string ConvertRunner::PresetFolder() {

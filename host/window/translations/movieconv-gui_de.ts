@@ -1259,6 +1259,34 @@
         <source>Made of “%1”.</source>
         <translation>Aus „%1“ gemacht.</translation>
     </message>
+    <message>
+        <source>cropping</source>
+        <translation>Beschneiden</translation>
+    </message>
+    <message>
+        <source>deinterlacing</source>
+        <translation>Zeilensprung entfernen</translation>
+    </message>
+    <message>
+        <source>HDR</source>
+        <translation>HDR</translation>
+    </message>
+    <message>
+        <source>colour depth</source>
+        <translation>Farbtiefe</translation>
+    </message>
+    <message>
+        <source>length of clips</source>
+        <translation>Länge der Clips</translation>
+    </message>
+    <message>
+        <source>leaving chapters out</source>
+        <translation>Kapitel weglassen</translation>
+    </message>
+    <message>
+        <source>leaving texts out</source>
+        <translation>Texte weglassen</translation>
+    </message>
 </context>
 <context>
     <name>Words</name>
@@ -1958,6 +1986,10 @@
     <message>
         <source>Close at once</source>
         <translation>Sofort schließen</translation>
+    </message>
+    <message>
+        <source>The preset is saved without what presets cannot hold: %1.</source>
+        <translation>Die Vorlage ist gespeichert, aber ohne das, was Vorlagen nicht enthalten können: %1.</translation>
     </message>
 </context>
 <context>

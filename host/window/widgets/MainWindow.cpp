@@ -195,7 +195,10 @@ void MainWindow::SavePreset(const Wishes& wishes) {
         dialog->setDirectory(folder);
     connect(dialog, &QFileDialog::fileSelected, this, [this, wishes](const QString& path) {
         try {
-            runner_.SavePreset(path.toStdString(), wishes);
+            const QStringList left = runner_.SavePreset(path.toStdString(), wishes);
+            if (!left.isEmpty())
+                Tell(tr("The preset is saved without what presets cannot hold: %1.")
+                         .arg(left.join(QStringLiteral(", "))));
             entryPage_->FillPresets();
             queue_.FillPresets();
             ShowEntry();
