@@ -55,11 +55,7 @@ void App::Take(const std::vector<std::string>& movies) {
 }
 
 void App::EndSoon() {
-    ending_ = true;
-    if (dispatcher_.IsWorking())
-        dispatcher_.StopAll();
-    else
-        QApplication::quit();
+    window_.StopAndClose();
 }
 
 /// Waits for no conversion: those that run are offered again the next time, with what they have written.
@@ -74,9 +70,7 @@ void App::OnWorkBegan() {
 
 void App::OnWorkEnded(const Totals& totals) {
     guard_.Release();
-    if (ending_)
-        QApplication::quit();
-    if (ending_ || totals.stopped || totals.done + totals.failed == 0)
+    if (window_.IsStopping() || totals.stopped || totals.done + totals.failed == 0)
         return; // who has just stopped it knows
     const AtEnd atEnd = settings_.LoadAtEnd();
     const QString text = totals.failed == 0

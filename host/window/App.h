@@ -49,7 +49,6 @@ private:
     Notifier notifier_;
     ColourWish colours_;
     MainWindow window_;
-    bool ending_ = false;
 };
 
 } // namespace movieconv::window

@@ -93,6 +93,10 @@
         <source>You may not write to the folder “%1”.</source>
         <translation>In den Ordner „%1“ darf nicht geschrieben werden.</translation>
     </message>
+    <message>
+        <source>There is a file “%1” already.</source>
+        <translation>Eine Datei „%1“ gibt es schon.</translation>
+    </message>
 </context>
 <context>
     <name>FormParts</name>
@@ -1435,6 +1439,33 @@
     </message>
 </context>
 <context>
+    <name>movieconv::window::Closing</name>
+    <message>
+        <source>Movies are being converted. What is converted so far can be kept as it is.</source>
+        <translation>Es werden gerade Filme umgewandelt. Was bisher fertig ist, kann behalten werden.</translation>
+    </message>
+    <message>
+        <source>Stop and close</source>
+        <translation>Abbrechen und schließen</translation>
+    </message>
+    <message>
+        <source>Close when done</source>
+        <translation>Schließen, wenn fertig</translation>
+    </message>
+    <message>
+        <source>Go on</source>
+        <translation>Weitermachen</translation>
+    </message>
+    <message>
+        <source>Waiting until all is stopped. A disk or a network that does not answer holds this up.</source>
+        <translation>Es wird gewartet, bis alles abgebrochen ist. Ein Laufwerk oder Netz, das nicht antwortet, hält das auf.</translation>
+    </message>
+    <message>
+        <source>Close at once</source>
+        <translation>Sofort schließen</translation>
+    </message>
+</context>
+<context>
     <name>movieconv::window::CropChoice</name>
     <message>
         <source>Crop</source>
@@ -1757,22 +1788,6 @@
         <translation>Der Datenträger mit „%1“ ist voll. Sobald Platz ist, geht die Umwandlung von selbst weiter; oder abbrechen und behalten, was fertig ist.</translation>
     </message>
     <message>
-        <source>Movies are being converted. What is converted so far can be kept as it is.</source>
-        <translation>Es werden gerade Filme umgewandelt. Was bisher fertig ist, kann behalten werden.</translation>
-    </message>
-    <message>
-        <source>Stop and close</source>
-        <translation>Abbrechen und schließen</translation>
-    </message>
-    <message>
-        <source>Close when done</source>
-        <translation>Schließen, wenn fertig</translation>
-    </message>
-    <message>
-        <source>Go on</source>
-        <translation>Weitermachen</translation>
-    </message>
-    <message>
         <source>“%1” is not a file on this machine.</source>
         <translation>„%1“ ist keine Datei auf diesem Rechner.</translation>
     </message>
@@ -1978,14 +1993,6 @@
     <message>
         <source>closes when done</source>
         <translation>schließt danach</translation>
-    </message>
-    <message>
-        <source>Waiting until all is stopped. A disk or a network that does not answer holds this up.</source>
-        <translation>Es wird gewartet, bis alles abgebrochen ist. Ein Laufwerk oder Netz, das nicht antwortet, hält das auf.</translation>
-    </message>
-    <message>
-        <source>Close at once</source>
-        <translation>Sofort schließen</translation>
     </message>
     <message>
         <source>The preset is saved without what presets cannot hold: %1.</source>
@@ -2365,6 +2372,10 @@
     <message>
         <source>Save as</source>
         <translation>Speichern als</translation>
+    </message>
+    <message>
+        <source>Another movie in the queue goes there as well. Choose another name.</source>
+        <translation>Ein anderer Film der Warteschlange geht auch dorthin. Bitte einen anderen Namen wählen.</translation>
     </message>
 </context>
 <context>

@@ -2,6 +2,7 @@
 
 #include "host/window/model/Intake.h"
 #include "host/window/model/Words.h"
+#include "host/window/widgets/Closing.h"
 #include "host/window/widgets/EntryPage.h"
 #include "host/window/widgets/NamingDialog.h"
 #include "host/window/widgets/NoticeBar.h"
@@ -24,14 +25,12 @@
 #include <algorithm>
 #include <cmath>
 #include <stdexcept>
-#include <utility>
 
 namespace movieconv::window {
 namespace {
 
 const QString kUriList = QStringLiteral("text/uri-list");
 const QString kInterrupted = QStringLiteral("interrupted");
-const QString kClosing = QStringLiteral("closing");
 const QString kFull = QStringLiteral("full");
 
 std::vector<std::string> Bytes(const QStringList& paths) {
@@ -57,6 +56,7 @@ MainWindow::MainWindow(Queue& queue, Dispatcher& dispatcher, Runner& runner, Set
       runner_(runner),
       settings_(settings),
       notices_(new NoticeBar),
+      closing_(new Closing(dispatcher, *notices_, this)),
       pages_(new QStackedWidget),
       view_(new QueueView(queue)),
       details_(new QStackedWidget),
@@ -98,10 +98,12 @@ void MainWindow::Connect() {
     connect(&queue_, &Queue::Complaint, this, &MainWindow::Tell);
     connect(&dispatcher_, &Dispatcher::Progressed, this, &MainWindow::ShowTotals);
     connect(&dispatcher_, &Dispatcher::Ended, this, &MainWindow::OnEnded);
-    connect(&dispatcher_, &Dispatcher::WorkEnded, this, [this] {
-        ShowAll();
-        if (closing_)
-            close();
+    connect(&dispatcher_, &Dispatcher::WorkEnded, this, &MainWindow::ShowAll);
+    connect(closing_, &Closing::Changed, this, &MainWindow::ShowTotals);
+    connect(closing_, &Closing::Ready, this, &MainWindow::close);
+    connect(closing_, &Closing::LeaveWanted, this, [this] {
+        settings_.SaveGeometry(saveGeometry());
+        Q_EMIT LeaveWanted();
     });
     connect(&dispatcher_, &Dispatcher::PictureCame, workPage_, &WorkPage::ShowPicture);
     connect(workPage_, &WorkPage::PictureRoomChanged, &dispatcher_, &Dispatcher::SetPictureRoom);
@@ -278,7 +280,7 @@ void MainWindow::ShowTotals() {
             parts += tr("%1 left for all").arg(LeftText(*totals.left));
         if (dispatcher_.StopsAfterThis())
             parts += tr("stops after this one");
-        if (closing_)
+        if (closing_->IsPending())
             parts += tr("closes when done");
     } else if (totals.waiting > 0) {
         parts += tr("%n movies are ready", "", totals.waiting);
@@ -370,37 +372,17 @@ void MainWindow::OnEnded(quint64 id) {
         view_->Select(next->id);
 }
 
-void MainWindow::AskBeforeClosing() {
-    const auto close = [this](bool wanted) {
-        closing_ = wanted;
-        ShowTotals();
-    };
-    notices_->Show(kClosing, tr("Movies are being converted. What is converted so far can be kept as it is."),
-                   {{tr("Stop and close"), [this] { StopAndClose(); }},
-                    {tr("Close when done"), [close] { close(true); }},
-                    {tr("Go on"), [close] { close(false); }}});
+void MainWindow::StopAndClose() {
+    closing_->StopAndClose();
 }
 
-void MainWindow::StopAndClose() {
-    closing_ = true;
-    ShowTotals();
-    notices_->Show(
-        kClosing, tr("Waiting until all is stopped. A disk or a network that does not answer holds this up."),
-        {{tr("Close at once"), [this] {
-              settings_.SaveGeometry(saveGeometry());
-              Q_EMIT LeaveWanted();
-          }}});
-    if (!std::exchange(stopping_, true))
-        dispatcher_.StopAll();
+bool MainWindow::IsStopping() const {
+    return closing_->IsStopping();
 }
 
 void MainWindow::closeEvent(QCloseEvent* event) {
-    if (dispatcher_.IsWorking()) {
+    if (!closing_->MayClose()) {
         event->ignore();
-        if (stopping_ || notices_->Shows(kClosing)) // asked already: the second wish is an answer
-            StopAndClose();
-        else
-            AskBeforeClosing();
         return;
     }
     settings_.SaveGeometry(saveGeometry());

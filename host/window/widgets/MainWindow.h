@@ -18,6 +18,7 @@ class QStackedWidget;
 
 namespace movieconv::window {
 
+class Closing;
 class EntryPage;
 class NoticeBar;
 class OverPage;
@@ -34,6 +35,10 @@ public:
     void Tell(const QString& sentence);
     /// Offers what was interrupted once more.
     void OfferInterrupted();
+    /// Stops everything, then closes, without asking.
+    void StopAndClose();
+    /// Whether it closes as soon as everything is stopped.
+    bool IsStopping() const;
 
 Q_SIGNALS:
     /// The user wants the program to end, and nothing stands in the way.
@@ -75,15 +80,11 @@ private:
     void ShowAll();
     void OnChanged(quint64 id);
     void OnEnded(quint64 id);
-    void AskBeforeClosing();
-    void StopAndClose();
 
     Queue& queue_;
     Dispatcher& dispatcher_;
     Runner& runner_;
     Settings& settings_;
-    bool closing_ = false;
-    bool stopping_ = false; // in order to close
 
     QAction* start_ = nullptr;
     QAction* pause_ = nullptr;
@@ -98,6 +99,7 @@ private:
     QAction* folder_ = nullptr;
 
     NoticeBar* notices_;
+    Closing* closing_;
     QStackedWidget* pages_; // empty or the workspace
     QueueView* view_;
     QStackedWidget* details_;
