@@ -58,6 +58,44 @@ TEST_F(ClosingTest, StaysWhenWhoWantedToCloseGoesOn) {
     EXPECT_TRUE(closed.isEmpty());
 }
 
+TEST_F(ClosingTest, ConvertsByWhatIsTyped) {
+    Add({"a.mkv"});
+    Window().activateWindow();
+    ASSERT_TRUE(QTest::qWaitForWindowActive(&Window()));
+    for (const auto& [field, words] :
+         {std::pair("File to save as", QString::fromStdString(folder / "mine.mp4")),
+          std::pair("End of the range", QStringLiteral("0:30"))}) {
+        auto* edit = Named<QLineEdit>(field);
+        edit->setFocus();
+        edit->selectAll();
+        QTest::keyClicks(edit, words);
+        QTest::keyClick(edit, Qt::Key_Return, Qt::ControlModifier);
+        ASSERT_TRUE(AwaitScripts(1));
+        const Order order = Script(0).order;
+        Script(0).End(Ending::kStopped);
+        ASSERT_TRUE(Await([&] { return !app->TheDispatcher().IsWorking(); }));
+        runner.scripts.clear();
+        Act("again");
+        ASSERT_TRUE(Await([&] { return At(0).IsStartable(); }));
+        EXPECT_EQ(order.target, folder / "mine.mp4");
+        EXPECT_EQ(order.wishes.end.has_value(), QByteArray(field).startsWith("End"));
+    }
+}
+
+TEST_F(ClosingTest, KeepsWhatIsTyped) {
+    Add({"a.mkv"});
+    Window().activateWindow();
+    ASSERT_TRUE(QTest::qWaitForWindowActive(&Window()));
+    auto* target = Named<QLineEdit>("File to save as");
+    target->setFocus();
+    target->selectAll();
+    QTest::keyClicks(target, QString::fromStdString(folder / "mine.mp4"));
+    std::string kept;
+    QObject::connect(&Window(), &MainWindow::Closed, &Window(), [&] { kept = At(0).target; });
+    Act("quit");
+    EXPECT_EQ(kept, folder / "mine.mp4");
+}
+
 TEST_F(ClosingTest, EndsSoonWithoutAsking) {
     const QSignalSpy closed(&Window(), &MainWindow::Closed);
     settings.Save(AtEnd{false, AtEnd::Then::kNothing});

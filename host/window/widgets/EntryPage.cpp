@@ -284,6 +284,11 @@ void EntryPage::Show(const Entry& entry) {
     filling_ = false;
 }
 
+void EntryPage::Commit() {
+    range_->Commit();
+    target_->Commit();
+}
+
 void EntryPage::ShowWishes() {
     const Wishes& wishes = entry_.wishes;
     ChooseItem(*preset_, wishes.preset);

@@ -236,6 +236,7 @@ void MainWindow::LoadPreset(quint64 id) {
 }
 
 void MainWindow::StartOrGoOn() {
+    entryPage_->Commit();
     if (dispatcher_.IsPaused())
         dispatcher_.ResumeAll();
     else
@@ -381,6 +382,7 @@ bool MainWindow::IsStopping() const {
 }
 
 void MainWindow::closeEvent(QCloseEvent* event) {
+    entryPage_->Commit();
     if (!closing_->MayClose()) {
         event->ignore();
         return;
