@@ -30,7 +30,44 @@ struct EditingTest : WindowBench {
     }
 };
 
+void TurnWheelOver(QWidget& widget) {
+    QWheelEvent turn(QPointF(5, 5), widget.mapToGlobal(QPointF(5, 5)), {}, QPoint(0, -120), Qt::NoButton,
+                     Qt::NoModifier, Qt::NoScrollPhase, false);
+    QApplication::sendEvent(&widget, &turn);
+}
+
 } // namespace
+
+TEST_F(EditingTest, LeavesTheWheelToThePage) {
+    Add({"a.mkv"});
+    Wishes wishes;
+    wishes.cut = Margins{10, 10, 10, 10};
+    wishes.subtitleFiles = {{folder / "a.srt", "de"}};
+    app->TheQueue().SetWishes(At(0).id, wishes);
+    for (QToolButton* button : The<EntryPage>()->findChildren<QToolButton*>())
+        if (button->isCheckable())
+            button->click();
+    Activate();
+    The<QueueView>()->setFocus();
+    const auto isControl = [](QWidget* widget) {
+        return qobject_cast<QComboBox*>(widget) || qobject_cast<QAbstractSpinBox*>(widget) ||
+               qobject_cast<QSlider*>(widget);
+    };
+    int controls = 0;
+    for (QWidget* widget : The<EntryPage>()->findChildren<QWidget*>()) {
+        if (!isControl(widget))
+            continue;
+        TurnWheelOver(*widget);
+        ++controls;
+        EXPECT_EQ(At(0).wishes, wishes) << widget->accessibleName().toStdString();
+        EXPECT_FALSE(widget->hasFocus()) << widget->accessibleName().toStdString();
+    }
+    EXPECT_GT(controls, 12);
+    auto* quality = Named<QSlider>("Quality");
+    quality->setFocus();
+    TurnWheelOver(*quality);
+    EXPECT_TRUE(At(0).wishes.quality) << "which has the focus";
+}
 
 TEST_F(EditingTest, GoesBackToTheNamingRulesAtOnce) {
     Add({"a.mkv"});

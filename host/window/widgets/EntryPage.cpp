@@ -53,6 +53,7 @@ EntryPage::EntryPage(Runner& runner, QWidget* parent)
     body->addLayout(MakeFoot());
     scroll->setWidget(page);
     MakeColumn(*this, 0)->addWidget(scroll);
+    LeaveWheelToPageBelow(*page);
     FillPresets();
     FillChoices();
     Connect();

@@ -3,8 +3,11 @@
 #include "host/window/model/Entry.h"
 #include "text/Path.h"
 
+#include <QAbstractSpinBox>
 #include <QCoreApplication>
+#include <QEvent>
 #include <QFileDialog>
+#include <QSlider>
 
 namespace movieconv::window {
 namespace {
@@ -13,7 +16,31 @@ struct Texts {
     Q_DECLARE_TR_FUNCTIONS(FormParts)
 };
 
+class WheelGuard : public QObject {
+public:
+    using QObject::QObject;
+
+    bool eventFilter(QObject* watched, QEvent* event) override {
+        if (event->type() != QEvent::Wheel || static_cast<QWidget*>(watched)->hasFocus())
+            return false;
+        event->ignore(); // and so it comes to the page
+        return true;
+    }
+};
+
 } // namespace
+
+void LeaveWheelToPage(QWidget& control) {
+    control.setFocusPolicy(Qt::StrongFocus);
+    control.installEventFilter(new WheelGuard(&control));
+}
+
+void LeaveWheelToPageBelow(QWidget& page) {
+    for (QWidget* widget : page.findChildren<QWidget*>())
+        if (qobject_cast<QComboBox*>(widget) != nullptr ||
+            qobject_cast<QAbstractSpinBox*>(widget) != nullptr || qobject_cast<QSlider*>(widget) != nullptr)
+            LeaveWheelToPage(*widget);
+}
 
 QVBoxLayout* MakeColumn(QWidget& owner, int spacing) {
     auto* column = new QVBoxLayout(&owner);

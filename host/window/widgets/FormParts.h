@@ -32,6 +32,11 @@ std::optional<T> ValueOf(const QComboBox& box) {
     return data.isValid() ? std::optional(data.value<T>()) : std::nullopt;
 }
 
+/// A control changes by the wheel only while it has the focus: over others the wheel moves the page.
+void LeaveWheelToPage(QWidget& control);
+/// Likewise for all that there is below `page`.
+void LeaveWheelToPageBelow(QWidget& page);
+
 /// A layout for `owner` that lies flush with what is around it.
 QVBoxLayout* MakeColumn(QWidget& owner, int spacing);
 
