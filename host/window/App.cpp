@@ -61,6 +61,7 @@ void App::EndSoon() {
 /// Waits for no conversion: those that run are offered again the next time, with what they have written.
 void App::Leave() {
     journal_.Settle();
+    settings_.Settle();
     std::_Exit(EXIT_SUCCESS);
 }
 

@@ -96,6 +96,32 @@ TEST_F(ClosingTest, KeepsWhatIsTyped) {
     EXPECT_EQ(kept, folder / "mine.mp4");
 }
 
+TEST_F(ClosingTest, KeepsHowTheWindowIsDivided) {
+    Add({"a.mkv"});
+    auto* splitter = The<QSplitter>();
+    splitter->setSizes({300, 780});
+    const QList<int> sizes = splitter->sizes();
+    Window().close();
+    Begin();
+    QApplication::processEvents();
+    EXPECT_EQ(The<QSplitter>()->sizes(), sizes);
+}
+
+TEST_F(ClosingTest, KeepsTheSettingsWhenItLeaves) {
+    runner.endsWhenStopped = false;
+    DoNotLeave();
+    std::string kept;
+    QObject::connect(&Window(), &MainWindow::LeaveWanted, &Window(),
+                     [&] { kept = ReadFile(folder / "settings"); });
+    StartOne("a.mkv");
+    Act("quit");
+    Act("quit");
+    Click("Close at once");
+    for (const char* name : {"geometry", "splitter"})
+        EXPECT_NE(kept.find(name), std::string::npos) << name;
+    Script(0).End(Ending::kStopped);
+}
+
 TEST_F(ClosingTest, EndsSoonWithoutAsking) {
     const QSignalSpy closed(&Window(), &MainWindow::Closed);
     settings.Save(AtEnd{false, AtEnd::Then::kNothing});

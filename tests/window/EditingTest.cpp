@@ -78,3 +78,10 @@ TEST_F(EditingTest, GoesBackToTheNamingRulesAtOnce) {
     EXPECT_EQ(At(0).target, folder / "a.mp4");
     EXPECT_FALSE(At(0).targetNamed);
 }
+
+TEST_F(EditingTest, ShowsHowManyMoviesAreConvertedAtTheSameTime) {
+    settings.SaveAtOnce(4);
+    Begin();
+    EXPECT_EQ(app->TheDispatcher().AtOnce(), 4);
+    EXPECT_TRUE(The<QAction>("atOnce4")->isChecked());
+}

@@ -19,6 +19,7 @@
 #include <QMimeData>
 #include <QProgressBar>
 #include <QPushButton>
+#include <QSplitter>
 #include <QStackedWidget>
 #include <QVBoxLayout>
 
@@ -87,6 +88,7 @@ MainWindow::MainWindow(Queue& queue, Dispatcher& dispatcher, Runner& runner, Set
     Connect();
     if (const QByteArray geometry = settings_.LoadGeometry(); !geometry.isEmpty())
         restoreGeometry(geometry);
+    splitter_->restoreState(settings_.LoadSplitter());
     ShowAll();
 }
 
@@ -102,7 +104,7 @@ void MainWindow::Connect() {
     connect(closing_, &Closing::Changed, this, &MainWindow::ShowTotals);
     connect(closing_, &Closing::Ready, this, &MainWindow::close);
     connect(closing_, &Closing::LeaveWanted, this, [this] {
-        settings_.SaveGeometry(saveGeometry());
+        KeepPlaces();
         Q_EMIT LeaveWanted();
     });
     connect(&dispatcher_, &Dispatcher::PictureCame, workPage_, &WorkPage::ShowPicture);
@@ -241,6 +243,13 @@ void MainWindow::StartOrGoOn() {
         dispatcher_.ResumeAll();
     else
         dispatcher_.Start();
+}
+
+/// On the disk at once: the program may be left without another chance.
+void MainWindow::KeepPlaces() {
+    settings_.SaveGeometry(saveGeometry());
+    settings_.SaveSplitter(splitter_->saveState());
+    settings_.Settle();
 }
 
 /// The page that the chosen movie's state asks for.
@@ -387,7 +396,7 @@ void MainWindow::closeEvent(QCloseEvent* event) {
         event->ignore();
         return;
     }
-    settings_.SaveGeometry(saveGeometry());
+    KeepPlaces();
     event->accept();
     Q_EMIT Closed();
 }

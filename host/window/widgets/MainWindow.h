@@ -71,6 +71,7 @@ private:
     void OpenFiles();
     void OpenFolder();
     void StartOrGoOn();
+    void KeepPlaces();
     void ShowNaming();
     void SavePreset(const Wishes& wishes);
     void LoadPreset(quint64 id);
@@ -102,6 +103,7 @@ private:
     Closing* closing_;
     QStackedWidget* pages_; // empty or the workspace
     QueueView* view_;
+    QSplitter* splitter_ = nullptr; // between these two
     QStackedWidget* details_;
     EntryPage* entryPage_;
     WorkPage* workPage_;

@@ -130,7 +130,7 @@ void MainWindow::MakeAtOnceMenu(QMenu* menu) {
         QAction* action = menu->addAction(tr("%n movies", "", count));
         action->setObjectName(QStringLiteral("atOnce%1").arg(count));
         action->setCheckable(true);
-        action->setChecked(count == dispatcher_.AtOnce());
+        action->setChecked(count == settings_.LoadAtOnce());
         group->addAction(action);
         connect(action, &QAction::triggered, this, [this, count] {
             dispatcher_.SetAtOnce(count);
@@ -208,17 +208,17 @@ QWidget* MainWindow::MakeEmptyPage() {
 QWidget* MainWindow::MakeWorkspace() {
     for (QWidget* page : std::initializer_list<QWidget*>{entryPage_, workPage_, overPage_})
         details_->addWidget(page);
-    auto* splitter = new QSplitter(Qt::Horizontal);
-    splitter->addWidget(view_);
-    splitter->addWidget(details_);
-    splitter->setStretchFactor(0, 0);
-    splitter->setStretchFactor(1, 1);
-    splitter->setSizes({kListWidth, 1080 - kListWidth});
-    splitter->setHandleWidth(1);
-    splitter->setChildrenCollapsible(false);
+    splitter_ = new QSplitter(Qt::Horizontal);
+    splitter_->addWidget(view_);
+    splitter_->addWidget(details_);
+    splitter_->setStretchFactor(0, 0);
+    splitter_->setStretchFactor(1, 1);
+    splitter_->setSizes({kListWidth, 1080 - kListWidth});
+    splitter_->setHandleWidth(1);
+    splitter_->setChildrenCollapsible(false);
     view_->setMinimumWidth(kLeastOfList);
     details_->setMinimumWidth(kLeastOfPage);
-    return splitter;
+    return splitter_;
 }
 
 QWidget* MainWindow::MakeFoot() {
