@@ -61,6 +61,36 @@ TEST(Queue, FollowsEditsAndNamingUntilTheUserNamesTheTarget) {
     EXPECT_EQ(bench.At(1).findings.warnings.size(), 1);
 }
 
+TEST(Queue, TellsWhereSeveralMoviesGoToOneFile) {
+    Bench bench;
+    bench.Add({"a.avi", "b.avi", "c.avi"});
+    const auto shared = [&] {
+        std::vector<bool> all;
+        for (const Entry& entry : bench.queue.Entries())
+            all.push_back(entry.targetShared);
+        return all;
+    };
+    using Shared = std::vector<bool>;
+    bench.queue.SetTarget(bench.Id(0), bench.folder / "c.mp4");
+    EXPECT_EQ(bench.At(2).target, bench.folder / "c (2).mp4") << "which was not named";
+    EXPECT_EQ(shared(), (Shared{false, false, false}));
+    bench.queue.SetTarget(bench.Id(1), bench.folder / "c.mp4");
+    EXPECT_EQ(shared(), (Shared{true, true, false}));
+    bench.AwaitExamined();
+    EXPECT_EQ(shared(), (Shared{true, true, false}));
+    bench.journal.Settle();
+    Journal journal(bench.folder / "queue", [](const QString&) {});
+    Queue again(bench.runner, journal);
+    again.Restore();
+    EXPECT_TRUE(again.Entries().at(0).targetShared);
+    bench.queue.SetTarget(bench.Id(0), {});
+    EXPECT_EQ(shared(), (Shared{false, false, false}));
+    bench.queue.SetTarget(bench.Id(0), bench.At(1).target);
+    bench.queue.Remove({bench.Id(0)});
+    EXPECT_EQ(shared(), (Shared{false, false}));
+    bench.AwaitExamined();
+}
+
 TEST(Queue, MovesAndRemoves) {
     Bench bench;
     const QAbstractItemModelTester tester(&bench.queue,

@@ -191,12 +191,15 @@ void Queue::SetTarget(quint64 id, const std::string& path) {
     Entry* entry = FindWaiting(id);
     if (entry == nullptr || (entry->targetNamed && entry->target == path))
         return;
+    const Batch batch(*this);
     entry->targetNamed = !path.empty();
     entry->replace = false;
-    entry->target = path;
     if (path.empty())
         AssignTarget(*entry);
+    else
+        MoveTarget(*entry, path);
     AfterEdit(id);
+    MakeRoomFor(*entry);
 }
 
 void Queue::SetReplace(quint64 id, bool replace) {
@@ -328,11 +331,11 @@ void Queue::Examine(quint64 id) {
     const Batch batch(*this); // perhaps within another one
 }
 
-void Queue::ExamineAmong(const std::shared_ptr<const Targets>& targets, quint64 id) {
+void Queue::ExamineAmong(const std::shared_ptr<const TargetBook>& book, quint64 id) {
     const Entry* entry = Find(id);
     if (entry == nullptr)
         return;
-    worker_.Do(id, [this, targets, seen = *entry, naming = naming_, extension = ExtensionFor(entry->wishes),
+    worker_.Do(id, [this, book, seen = *entry, naming = naming_, extension = ExtensionFor(entry->wishes),
                     today = QDate::currentDate()] {
         Entry found = seen;
         try {
@@ -340,8 +343,7 @@ void Queue::ExamineAmong(const std::shared_ptr<const Targets>& targets, quint64 
                 found.facts = runner_.Look(found.source);
             if (!found.targetNamed && found.state == State::kWaiting) {
                 found.target = TargetFor(found, naming, extension, today, [&](const std::string& path) {
-                    const int own = path == seen.target ? 1 : 0;
-                    return CountOf(*targets, path) > own || Exists(path);
+                    return book->IsTaken(path, seen) || Exists(path);
                 });
             }
             found.findings =
@@ -359,7 +361,7 @@ void Queue::TakeFound(const Entry& seen, const Entry& found) {
     if (now == nullptr || now->state != seen.state || now->wishes != seen.wishes ||
         now->target != seen.target || now->replace != seen.replace)
         return; // edited meanwhile, and so examined again
-    if (!found.targetNamed && IsTakenByOther(*now, found.target)) {
+    if (!found.targetNamed && TargetBook(entries_).IsTaken(found.target, *now)) {
         Examine(seen.id);
         return;
     }
@@ -379,30 +381,42 @@ void Queue::TakeFound(const Entry& seen, const Entry& found) {
 void Queue::AssignTarget(Entry& entry) {
     const Batch batch(*this);
     if (!taken_)
-        taken_ = CountTargets();
-    if (const auto own = taken_->find(entry.target); own != taken_->end())
-        --own->second;
-    entry.target = TargetFor(
-        entry, naming_, ExtensionFor(entry.wishes), QDate::currentDate(),
-        [&](const std::string& path) { return path == entry.source || CountOf(*taken_, path) > 0; });
-    ++(*taken_)[entry.target];
+        taken_.emplace(entries_);
+    MoveTarget(entry, TargetFor(entry, naming_, ExtensionFor(entry.wishes), QDate::currentDate(),
+                                [&](const std::string& path) { return taken_->IsTaken(path, entry); }));
 }
 
-Queue::Targets Queue::CountTargets() const {
-    Targets targets;
-    for (const Entry& entry : entries_)
-        ++targets[entry.target];
-    return targets;
+void Queue::MoveTarget(Entry& entry, const std::string& path) {
+    if (taken_)
+        taken_->Move(entry.target, path);
+    entry.target = path;
 }
 
-int Queue::CountOf(const Targets& targets, const std::string& path) {
-    const auto found = targets.find(path);
-    return found == targets.end() ? 0 : found->second;
+/// A name that the user gives one movie is not another one's by the rules any more.
+void Queue::MakeRoomFor(const Entry& named) {
+    for (Entry& other : entries_) {
+        if (other.id == named.id || other.targetNamed || other.state != State::kWaiting ||
+            other.target != named.target)
+            continue;
+        AssignTarget(other);
+        AfterEdit(other.id);
+    }
 }
 
-bool Queue::IsTakenByOther(const Entry& entry, const std::string& path) const {
-    return std::any_of(entries_.begin(), entries_.end(),
-                       [&](const Entry& other) { return other.id != entry.id && other.target == path; });
+void Queue::MarkShared() {
+    const TargetBook book(entries_);
+    for (size_t row = 0; row < entries_.size(); ++row) {
+        const bool shared = book.IsShared(entries_[row].target);
+        if (entries_[row].targetShared != shared)
+            Change(
+                entries_[row].id, [shared](Entry& entry) { entry.targetShared = shared; }, false);
+    }
+}
+
+bool Queue::MayReplace(const Entry& entry) const {
+    return entry.replace && std::none_of(entries_.begin(), entries_.end(), [&](const Entry& other) {
+               return other.id != entry.id && other.target == entry.target && !other.outcome.files.empty();
+           });
 }
 
 void Queue::Keep() {
@@ -422,10 +436,11 @@ Queue::Batch::~Batch() {
     if (std::exchange(queue_.keepAfter_, false))
         queue_.journal_.Keep(queue_.entries_);
     if (const QList<quint64> ids = std::exchange(queue_.examineAfter_, {}); !ids.isEmpty()) {
-        const auto targets = std::make_shared<const Targets>(queue_.CountTargets());
+        const auto book = std::make_shared<const TargetBook>(queue_.entries_);
         for (const quint64 id : ids)
-            queue_.ExamineAmong(targets, id);
+            queue_.ExamineAmong(book, id);
     }
+    queue_.MarkShared();
     if (std::exchange(queue_.tellAfter_, false))
         Q_EMIT queue_.Rearranged();
 }

@@ -54,12 +54,15 @@ void TargetChoice::Show(const Entry& entry) {
         path_->setText(target_);
         path_->setCursorPosition(static_cast<int>(target_.size()));
     }
-    warnings_->setText(entry.findings.warnings.join(QLatin1Char('\n')));
-    warnings_->setVisible(!entry.findings.warnings.isEmpty());
+    QStringList warnings = entry.findings.warnings;
+    if (entry.targetShared)
+        warnings.prepend(tr("Another movie in the queue goes there as well. Choose another name."));
+    warnings_->setText(warnings.join(QLatin1Char('\n')));
+    warnings_->setVisible(!warnings.isEmpty());
     notes_->setText(entry.findings.notes.join(QLatin1Char('\n')));
     notes_->setVisible(!entry.findings.notes.isEmpty());
     replace_->setChecked(entry.replace);
-    replace_->setVisible(entry.findings.targetExists);
+    replace_->setVisible(entry.findings.targetExists && (!entry.targetShared || entry.replace));
 }
 
 void TargetChoice::Commit() {
