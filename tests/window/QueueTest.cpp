@@ -42,6 +42,19 @@ TEST(Queue, GivesEveryEntryATargetOfItsOwn) {
     EXPECT_EQ(targets.size(), 3U);
 }
 
+TEST(Queue, GivesClipsANameOfTheirOwn) {
+    Bench bench;
+    WriteFile(bench.folder / "a_00.mp4", "a clip of the user's");
+    WriteFile(bench.folder / "b.mp4", "which clips do not touch");
+    bench.Add({"a.avi", "b.avi"});
+    Wishes wishes;
+    wishes.clip = 60;
+    bench.queue.SetWishesOfAll(wishes);
+    bench.AwaitExamined();
+    EXPECT_EQ(bench.At(0).target, bench.folder / "a (2).mp4");
+    EXPECT_EQ(bench.At(1).target, bench.folder / "b.mp4");
+}
+
 TEST(Queue, FollowsEditsAndNamingUntilTheUserNamesTheTarget) {
     Bench bench;
     bench.Add({"a.avi", "b.avi"});

@@ -1,5 +1,6 @@
 // What the window's runner makes of presets and wishes.
 #include "host/convert/Formats.h"
+#include "host/window/runner/Foresight.h"
 #include "host/window/runner/PresetShelf.h"
 #include "host/window/runner/Translation.h"
 #include "tests/support/Folder.h"
@@ -268,6 +269,30 @@ TEST_F(RunnerTest, TellsWhichWishesPresetsCannotHold) {
     const QStringList names = WritePreset(Own("mine"), all);
     EXPECT_EQ(QSet<QString>(names.begin(), names.end()).size(), std::ssize(wishes))
         << names.join(", ").toStdString();
+}
+
+TEST_F(RunnerTest, LooksForTheFilesThatAnOrderWrites) {
+    WriteFile(folder / "whole.mp4", "x");
+    WriteFile(folder / "cut_03.mp4", "x");
+    const struct {
+        const char* target;
+        bool clips;
+        std::string existing;
+    } cases[] = {{"whole.mp4", false, folder / "whole.mp4"},
+                 {"whole.mp4", true, ""},
+                 {"cut.mp4", false, ""},
+                 {"cut.mp4", true, folder / "cut_03.mp4"}};
+    for (const auto& [target, clips, existing] : cases) {
+        Wishes wishes;
+        if (clips)
+            wishes.clip = 60;
+        const Order order = OrderOf(wishes, folder / target);
+        EXPECT_EQ(ExistingFileOf(order), existing) << target;
+        const Findings findings = Foresee(order);
+        EXPECT_EQ(findings.targetExists, !existing.empty()) << target;
+        const QStringList told = findings.warnings.filter(QStringLiteral("already"));
+        EXPECT_EQ(told.size(), existing.empty() ? 0 : 1) << target;
+    }
 }
 
 TEST_F(RunnerTest, TakesAPresetFromElsewhere) {

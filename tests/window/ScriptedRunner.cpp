@@ -2,6 +2,7 @@
 
 #include "tests/support/Folder.h"
 
+#include <filesystem>
 #include <stdexcept>
 
 using namespace movieconv::window;
@@ -142,9 +143,16 @@ MovieFacts ScriptedRunner::Look(const std::string& path) {
     return facts;
 }
 
+std::string ScriptedRunner::FileInTheWay(const Order& order) {
+    std::filesystem::path file = order.target;
+    if (order.wishes.clip)
+        file.replace_filename(file.stem().string() + "_00" + file.extension().string());
+    return std::filesystem::exists(file) ? file.string() : std::string();
+}
+
 Findings ScriptedRunner::Check(const Order& order) {
     Findings findings;
-    findings.targetExists = !ReadFile(order.target).empty();
+    findings.targetExists = !FileInTheWay(order).empty();
     if (findings.targetExists)
         findings.warnings += QStringLiteral("The target exists.");
     return findings;

@@ -44,6 +44,7 @@ public:
           std::shared_ptr<movieconv::window::RunListener> listener) override;
     /// A file whose text begins with "movie" is one; a number behind it tells its seconds.
     movieconv::window::MovieFacts Look(const std::string& path) override;
+    std::string FileInTheWay(const movieconv::window::Order& order) override;
     movieconv::window::Findings Check(const movieconv::window::Order& order) override;
     QImage PictureAt(const std::string& path, double seconds, int width) override;
 

@@ -6,19 +6,10 @@
 #include <QSet>
 
 #include <algorithm>
-#include <filesystem>
 #include <stdexcept>
 #include <utility>
 
 namespace movieconv::window {
-namespace {
-
-bool Exists(const std::string& path) {
-    std::error_code unknown;
-    return std::filesystem::exists(std::filesystem::symlink_status(path, unknown));
-}
-
-} // namespace
 
 Queue::Queue(Runner& runner, Journal& journal, QObject* parent)
     : QAbstractListModel(parent), runner_(runner), journal_(journal), presets_(runner.Presets()) {}
@@ -343,7 +334,9 @@ void Queue::ExamineAmong(const std::shared_ptr<const TargetBook>& book, quint64 
                 found.facts = runner_.Look(found.source);
             if (!found.targetNamed && found.state == State::kWaiting) {
                 found.target = TargetFor(found, naming, extension, today, [&](const std::string& path) {
-                    return book->IsTaken(path, seen) || Exists(path);
+                    return book->IsTaken(path, seen) ||
+                           !runner_.FileInTheWay({found.source, path, found.wishes, false, *found.facts})
+                                .empty();
                 });
             }
             found.findings =

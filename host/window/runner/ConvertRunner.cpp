@@ -229,6 +229,10 @@ MovieFacts ConvertRunner::Look(const std::string& path) {
     }
 }
 
+std::string ConvertRunner::FileInTheWay(const Order& order) {
+    return ExistingFileOf(order);
+}
+
 Findings ConvertRunner::Check(const Order& order) {
     return Foresee(order);
 }

@@ -18,6 +18,7 @@ public:
     std::string PresetFolder() override;
     std::unique_ptr<Run> Start(const Order& order, std::shared_ptr<RunListener> listener) override;
     MovieFacts Look(const std::string& path) override;
+    std::string FileInTheWay(const Order& order) override;
     Findings Check(const Order& order) override;
     QImage PictureAt(const std::string& path, double seconds, int width) override;
 
