@@ -79,6 +79,40 @@ TEST_F(EditingTest, GoesBackToTheNamingRulesAtOnce) {
     EXPECT_FALSE(At(0).targetNamed);
 }
 
+TEST_F(EditingTest, CompletesNames) {
+    Add({"a.mkv"});
+    Activate();
+    const struct {
+        QString typed;
+        std::string target;
+    } cases[] = {{"mine.mkv", folder / "mine.mkv"},
+                 {"mine", folder / "mine.mp4"},
+                 {"mr. b. 1.5", folder / "mr. b. 1.5.mp4"},
+                 {"more/mine.m4v", folder / "more/mine.m4v"},
+                 {"./more/../mine.mp4", folder / "mine.mp4"},
+                 {"/elsewhere/mine.mp4", "/elsewhere/mine.mp4"},
+                 {"~/mine.mp4", QDir::homePath().toStdString() + "/mine.mp4"}};
+    for (const auto& [typed, target] : cases) {
+        Type("File to save as", typed + "\r");
+        EXPECT_EQ(At(0).target, target);
+        EXPECT_EQ(Named<QLineEdit>("File to save as")->text().toStdString(), target);
+    }
+}
+
+TEST_F(EditingTest, GivesAChosenNameTheExtensionOfTheFormat) {
+    Add({"a.mkv"});
+    Activate();
+    Type("File to save as", "mine.mp4\r");
+    QTest::keyClicks(Named<QComboBox>("File format"), "Matr");
+    EXPECT_EQ(At(0).wishes.format, "mkv");
+    EXPECT_EQ(At(0).target, folder / "mine.mkv");
+    QTest::keyClick(Named<QComboBox>("Preset"), Qt::Key_Down);
+    EXPECT_EQ(At(0).target, folder / "mine.webm") << "the preset's";
+    Type("File to save as", "mine.mkv\r");
+    QTest::keyClick(Named<QSlider>("Quality"), Qt::Key_Home);
+    EXPECT_EQ(At(0).target, folder / "mine.mkv") << "as it was named";
+}
+
 TEST_F(EditingTest, ShowsHowManyMoviesAreConvertedAtTheSameTime) {
     settings.SaveAtOnce(4);
     Begin();

@@ -172,16 +172,43 @@ void Queue::SetWishes(quint64 id, const Wishes& wishes) {
     Entry* entry = FindWaiting(id);
     if (entry == nullptr || entry->wishes == wishes)
         return;
+    const Batch batch(*this);
+    const QString before = ExtensionFor(entry->wishes);
     entry->wishes = wishes;
-    if (!entry->targetNamed)
+    if (entry->targetNamed)
+        RenameForFormat(*entry, before);
+    else
         AssignTarget(*entry);
     AfterEdit(id);
 }
 
-void Queue::SetTarget(quint64 id, const std::string& path) {
-    Entry* entry = FindWaiting(id);
-    if (entry == nullptr || (entry->targetNamed && entry->target == path))
+/// The file's format follows its name.
+void Queue::RenameForFormat(Entry& entry, const QString& before) {
+    const QString extension = ExtensionFor(entry.wishes);
+    if (extension == before)
         return;
+    entry.replace = false;
+    MoveTarget(entry, WithExtension(entry.target, extension, KnownExtensions()));
+    MakeRoomFor(entry);
+}
+
+QStringList Queue::KnownExtensions() const {
+    QStringList known = MovieExtensions();
+    for (const FormatFacts& format : runner_.Formats())
+        known += format.extension;
+    return known;
+}
+
+void Queue::SetTarget(quint64 id, const std::string& typed) {
+    Entry* entry = FindWaiting(id);
+    if (entry == nullptr)
+        return;
+    const std::string path =
+        typed.empty() ? std::string()
+                      : CompletePath(typed, *entry, ExtensionFor(entry->wishes), KnownExtensions());
+    if (entry->targetNamed && entry->target == path)
+        return Change(
+            id, [](Entry&) {}, false); // it may be shown as it was typed
     const Batch batch(*this);
     entry->targetNamed = !path.empty();
     entry->replace = false;

@@ -54,8 +54,9 @@ public:
 
     /// Change an entry that is waiting; others are left alone.
     void SetWishes(quint64 id, const Wishes& wishes);
-    /// An empty path goes back to the naming rules.
-    void SetTarget(quint64 id, const std::string& path);
+    /// What the user calls it: a name alone is beside the source, a missing extension is the format's. An
+    /// empty path goes back to the naming rules.
+    void SetTarget(quint64 id, const std::string& typed);
     void SetReplace(quint64 id, bool replace);
     /// Whether it replaces a file that exists: where that is wished, but for what another entry has become.
     bool MayReplace(const Entry& entry) const;
@@ -116,6 +117,8 @@ private:
     void ExamineAmong(const std::shared_ptr<const TargetBook>& book, quint64 id);
     void TakeFound(const Entry& seen, const Entry& found);
     void AssignTarget(Entry& entry);
+    void RenameForFormat(Entry& entry, const QString& before);
+    QStringList KnownExtensions() const;
     void MoveTarget(Entry& entry, const std::string& path);
     void MakeRoomFor(const Entry& named);
     void MarkShared();
