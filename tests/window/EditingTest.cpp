@@ -119,3 +119,32 @@ TEST_F(EditingTest, ShowsHowManyMoviesAreConvertedAtTheSameTime) {
     EXPECT_EQ(app->TheDispatcher().AtOnce(), 4);
     EXPECT_TRUE(The<QAction>("atOnce4")->isChecked());
 }
+
+TEST_F(EditingTest, IsWalkedThroughInTheOrderOfThePage) {
+    runner.subtitles = 5;
+    Add({"a.mkv"});
+    Wishes wishes;
+    wishes.subtitleFiles = {{folder / "a.srt", "de"}};
+    app->TheQueue().SetWishes(At(0).id, wishes);
+    ASSERT_TRUE(Await([&] { return At(0).IsStartable(); }));
+    Activate();
+    The<QueueView>()->setFocus();
+    QList<QWidget*> walk;
+    for (int i = 0; i < 60; ++i) {
+        QTest::keyClick(QApplication::focusWidget(), Qt::Key_Tab);
+        walk += QApplication::focusWidget();
+        EXPECT_EQ(qobject_cast<QScrollArea*>(walk.last()), nullptr);
+    }
+    const std::vector<QWidget*> order = {Named<QComboBox>("File format"),
+                                         Check("Kommentar"),
+                                         Check("Leave the sound"),
+                                         Check("French"),
+                                         Named<QPushButton>("Subtitles: All"),
+                                         Named<QComboBox>("Language of a.srt"),
+                                         Named<QToolButton>("Leave a.srt out"),
+                                         Button("Add a subtitle file…"),
+                                         Named<QLineEdit>("File to save as"),
+                                         The<QPushButton>("startButton")};
+    for (size_t i = 1; i < order.size(); ++i)
+        EXPECT_LT(walk.indexOf(order[i - 1]), walk.indexOf(order[i])) << i;
+}

@@ -71,6 +71,7 @@ private:
     QLabel* facts_;
     QLabel* unusable_;
     QPushButton* look_;
+    QWidget* page_; // which is scrolled
     QWidget* body_;
     QComboBox* preset_;
     QLabel* description_;

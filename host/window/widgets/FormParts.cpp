@@ -28,7 +28,25 @@ public:
     }
 };
 
+void CollectControls(const QLayout& layout, QList<QWidget*>& controls) {
+    for (int i = 0; i < layout.count(); ++i) {
+        QLayoutItem* item = layout.itemAt(i);
+        QWidget* widget = item->widget();
+        if (widget != nullptr && (widget->focusPolicy() & Qt::TabFocus) != 0)
+            controls += widget;
+        else if (const QLayout* inner = widget != nullptr ? widget->layout() : item->layout())
+            CollectControls(*inner, controls);
+    }
+}
+
 } // namespace
+
+void OrderTabs(QWidget& page) {
+    QList<QWidget*> controls;
+    CollectControls(*page.layout(), controls);
+    for (qsizetype i = 1; i < controls.size(); ++i)
+        QWidget::setTabOrder(controls[i - 1], controls[i]);
+}
 
 void LeaveWheelToPage(QWidget& control) {
     control.setFocusPolicy(Qt::StrongFocus);

@@ -37,6 +37,10 @@ void LeaveWheelToPage(QWidget& control);
 /// Likewise for all that there is below `page`.
 void LeaveWheelToPageBelow(QWidget& page);
 
+/// Lets the Tab key go through the controls below `page` in the order of its layouts; those that came later
+/// are the last ones else.
+void OrderTabs(QWidget& page);
+
 /// A layout for `owner` that lies flush with what is around it.
 QVBoxLayout* MakeColumn(QWidget& owner, int spacing);
 
