@@ -5,6 +5,7 @@
 #include <QApplication>
 #include <QStyle>
 
+#include <chrono>
 #include <cstdlib>
 
 namespace movieconv::window {
@@ -58,7 +59,11 @@ void App::EndSoon() {
     window_.StopAndClose();
 }
 
-/// Waits for no conversion: those that run are offered again the next time, with what they have written.
+bool App::CanEnd() {
+    constexpr std::chrono::seconds kPatience{2};
+    return Worker::AwaitAll(kPatience);
+}
+
 void App::Leave() {
     journal_.Settle();
     settings_.Settle();

@@ -130,3 +130,14 @@ TEST_F(ClosingTest, EndsSoonWithoutAsking) {
     EXPECT_TRUE(Script(0).stopped);
     EXPECT_TRUE(Await([&] { return closed.size() == 1; }));
 }
+
+TEST_F(ClosingTest, CannotEndInOrderWhileAMovieDoesNotOpen) {
+    runner.looking.Shut();
+    app->TheQueue().Add({Movie("a.mkv")});
+    ASSERT_TRUE(Await([&] { return !app->TheQueue().Entries().empty(); }));
+    runner.looking.AwaitHeld();
+    Window().close();
+    EXPECT_FALSE(App::CanEnd());
+    runner.looking.Open();
+    EXPECT_TRUE(App::CanEnd());
+}
