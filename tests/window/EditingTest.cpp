@@ -113,6 +113,55 @@ TEST_F(EditingTest, GivesAChosenNameTheExtensionOfTheFormat) {
     EXPECT_EQ(At(0).target, folder / "mine.mkv") << "as it was named";
 }
 
+TEST_F(EditingTest, MovesTheRangeByTheLeftButtonAlone) {
+    Add({"a.mkv"});
+    auto* strip = The<RangeStrip>();
+    ASSERT_TRUE(Await([&] { return strip->isEnabled(); }));
+    for (const Qt::MouseButton button : {Qt::RightButton, Qt::MiddleButton})
+        QTest::mouseClick(strip, button, {}, QPoint(strip->width() / 2, 20));
+    EXPECT_EQ(At(0).wishes, Wishes());
+}
+
+TEST_F(EditingTest, TakesDroppedMoviesWithoutMovingThem) {
+    QMimeData data;
+    data.setData(QStringLiteral("text/uri-list"), "file://" + QByteArray::fromStdString(Movie("a.mkv")));
+    const Qt::DropActions both = Qt::MoveAction | Qt::CopyAction;
+    QDragEnterEvent enter({300, 300}, both, &data, Qt::LeftButton, Qt::ShiftModifier);
+    QApplication::sendEvent(&Window(), &enter);
+    EXPECT_EQ(enter.dropAction(), Qt::CopyAction);
+    QDropEvent drop({300, 300}, both, &data, Qt::LeftButton, Qt::ShiftModifier);
+    QApplication::sendEvent(&Window(), &drop);
+    EXPECT_TRUE(drop.isAccepted());
+    EXPECT_EQ(drop.dropAction(), Qt::CopyAction) << "else the one who gave it removes it";
+}
+
+TEST_F(EditingTest, PlaysWhatIsSelectedAlthoughItIsNotCurrent) {
+    QObject::disconnect(&Window(), &MainWindow::FileWanted, nullptr, nullptr);
+    const QSignalSpy files(&Window(), &MainWindow::FileWanted);
+    Add({"a.mkv"});
+    Act("start");
+    ASSERT_TRUE(AwaitScripts(1));
+    Script(0).End(Ending::kDone);
+    ASSERT_TRUE(Await([&] { return !app->TheDispatcher().IsWorking(); }));
+    Add({"b.mkv"});
+    Select(1);
+    The<QueueView>()->selectAll();
+    Act("play");
+    EXPECT_EQ(files.size(), 1);
+}
+
+TEST_F(EditingTest, NamesAPresetThatIsGone) {
+    Wishes wishes;
+    wishes.preset = "vanished";
+    settings.Save(wishes);
+    Begin();
+    Add({"a.mkv"});
+    auto* preset = Named<QComboBox>("Preset");
+    EXPECT_EQ(preset->currentText(), "");
+    EXPECT_EQ(preset->placeholderText(), "vanished");
+    EXPECT_EQ(At(0).wishes.preset, "vanished");
+}
+
 TEST_F(EditingTest, ShowsHowManyMoviesAreConvertedAtTheSameTime) {
     settings.SaveAtOnce(4);
     Begin();

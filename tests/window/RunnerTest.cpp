@@ -127,6 +127,12 @@ TEST_F(RunnerTest, AsksTheLibraryForWhatIsWished) {
     EXPECT_EQ(request.size->width, 864);
     EXPECT_EQ(request.crop.top + request.crop.bottom, 280);
     EXPECT_FALSE(request.detectCrop);
+    wishes.height = 1080; // the source's, which what is left does not have any more
+    request = ToRequest(OrderOf(wishes, "out.webm"));
+    ASSERT_TRUE(request.size);
+    EXPECT_EQ(request.size->height, 1080);
+    wishes.height = 800;
+    EXPECT_FALSE(ToRequest(OrderOf(wishes, "out.webm")).size) << "what is left has just that";
 
     EXPECT_TRUE(ToRequest(OrderOf({}, "out.mp3")).noVideo);
     Wishes lost;

@@ -293,7 +293,8 @@ void EntryPage::Commit() {
 
 void EntryPage::ShowWishes() {
     const Wishes& wishes = entry_.wishes;
-    ChooseItem(*preset_, wishes.preset);
+    preset_->setCurrentIndex(preset_->findData(wishes.preset));
+    preset_->setPlaceholderText(wishes.preset); // of one that is gone
     const PresetFacts* preset = CurrentPreset();
     description_->setText(preset != nullptr ? preset->description : QString());
     description_->setToolTip(description_->text()); // a narrow window cuts it

@@ -49,6 +49,12 @@ QList<quint64> Interrupted(const Queue& queue) {
     return ids;
 }
 
+/// The files stay where they are: after a move, who gave them would remove them.
+void AcceptAsCopy(QDropEvent& event) {
+    event.setDropAction(Qt::CopyAction);
+    event.accept();
+}
+
 } // namespace
 
 MainWindow::MainWindow(Queue& queue, Dispatcher& dispatcher, Runner& runner, Settings& settings)
@@ -409,7 +415,7 @@ void MainWindow::changeEvent(QEvent* event) {
 
 void MainWindow::dragEnterEvent(QDragEnterEvent* event) {
     if (event->mimeData()->hasFormat(kUriList))
-        event->acceptProposedAction();
+        AcceptAsCopy(*event);
 }
 
 void MainWindow::dropEvent(QDropEvent* event) {
@@ -417,7 +423,7 @@ void MainWindow::dropEvent(QDropEvent* event) {
     queue_.Add(PathsOfUriList(event->mimeData()->data(kUriList), others));
     for (const QString& other : others)
         Tell(tr("“%1” is not a file on this machine.").arg(other));
-    event->acceptProposedAction();
+    AcceptAsCopy(*event);
 }
 
 } // namespace movieconv::window

@@ -82,17 +82,19 @@ void MainWindow::MakeQueueMenu() {
     menu->addSeparator();
     again_ = Add(menu, "again", tr("Convert &again"), tr("Ctrl+R"),
                  [this] { queue_.Retry(view_->SelectedIds()); });
-    const auto currentFile = [this] {
-        const Entry* entry = queue_.Find(view_->CurrentId());
-        return entry != nullptr && !entry->outcome.files.empty() ? entry->outcome.files.front()
-                                                                 : std::string();
+    // The current movie's, or of those selected the first one's that has any.
+    const auto chosenFile = [this] {
+        for (const quint64 id : QList<quint64>{view_->CurrentId()} + view_->SelectedIds())
+            if (const Entry* entry = queue_.Find(id); entry != nullptr && !entry->outcome.files.empty())
+                return entry->outcome.files.front();
+        return std::string();
     };
-    play_ = Add(menu, "play", tr("&Play the converted movie"), tr("Ctrl+Shift+P"), [this, currentFile] {
-        if (const std::string file = currentFile(); !file.empty())
+    play_ = Add(menu, "play", tr("&Play the converted movie"), tr("Ctrl+Shift+P"), [this, chosenFile] {
+        if (const std::string file = chosenFile(); !file.empty())
             Q_EMIT FileWanted(file);
     });
-    folder_ = Add(menu, "folder", tr("Show in &folder"), tr("Ctrl+Shift+F"), [this, currentFile] {
-        if (const std::string file = currentFile(); !file.empty())
+    folder_ = Add(menu, "folder", tr("Show in &folder"), tr("Ctrl+Shift+F"), [this, chosenFile] {
+        if (const std::string file = chosenFile(); !file.empty())
             Q_EMIT FolderWanted(file);
     });
     menu->addSeparator();
