@@ -425,11 +425,11 @@ void Queue::MakeRoomFor(const Entry& named) {
 
 void Queue::MarkShared() {
     const TargetBook book(entries_);
-    for (size_t row = 0; row < entries_.size(); ++row) {
-        const bool shared = book.IsShared(entries_[row].target);
-        if (entries_[row].targetShared != shared)
+    for (const Entry& entry : entries_) {
+        const bool shared = book.IsShared(entry.target);
+        if (entry.targetShared != shared)
             Change(
-                entries_[row].id, [shared](Entry& entry) { entry.targetShared = shared; }, false);
+                entry.id, [shared](Entry& known) { known.targetShared = shared; }, false);
     }
 }
 
