@@ -5,6 +5,7 @@
 #include <QApplication>
 #include <QStyle>
 
+#include <chrono>
 #include <cstdlib>
 
 namespace movieconv::window {
@@ -55,16 +56,17 @@ void App::Take(const std::vector<std::string>& movies) {
 }
 
 void App::EndSoon() {
-    ending_ = true;
-    if (dispatcher_.IsWorking())
-        dispatcher_.StopAll();
-    else
-        QApplication::quit();
+    window_.StopAndClose();
 }
 
-/// Waits for no conversion: those that run are offered again the next time, with what they have written.
+bool App::CanEnd() {
+    constexpr std::chrono::seconds kPatience{2};
+    return Worker::AwaitAll(kPatience);
+}
+
 void App::Leave() {
     journal_.Settle();
+    settings_.Settle();
     std::_Exit(EXIT_SUCCESS);
 }
 
@@ -74,9 +76,7 @@ void App::OnWorkBegan() {
 
 void App::OnWorkEnded(const Totals& totals) {
     guard_.Release();
-    if (ending_)
-        QApplication::quit();
-    if (ending_ || totals.stopped || totals.done + totals.failed == 0)
+    if (window_.IsStopping() || totals.stopped || totals.done + totals.failed == 0)
         return; // who has just stopped it knows
     const AtEnd atEnd = settings_.LoadAtEnd();
     const QString text = totals.failed == 0

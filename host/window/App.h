@@ -29,13 +29,18 @@ public:
     void Take(const std::vector<std::string>& movies);
     /// Keeps what is done, then ends the program: nobody can be asked.
     void EndSoon();
+    /// Once nothing is handled any more: whether the program can end in order. It cannot while a movie or a
+    /// disk does not answer; then only leaving is left.
+    static bool CanEnd();
+    /// Ends the program at once, waiting for no movie and no conversion: those that run are offered again the
+    /// next time, with what they have written.
+    [[noreturn]] void Leave();
 
     MainWindow& Window() { return window_; }
     Queue& TheQueue() { return queue_; }
     Dispatcher& TheDispatcher() { return dispatcher_; }
 
 private:
-    void Leave();
     void OnWorkBegan();
     void OnWorkEnded(const Totals& totals);
     void Raise();
@@ -49,7 +54,6 @@ private:
     Notifier notifier_;
     ColourWish colours_;
     MainWindow window_;
-    bool ending_ = false;
 };
 
 } // namespace movieconv::window

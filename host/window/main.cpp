@@ -99,5 +99,8 @@ int main(int argc, char** argv) {
     WatchSignals(app);
     QObject::connect(&instance, &Instance::Asked, &app, &App::Take);
     app.Begin(movies);
-    return QApplication::exec();
+    const int result = QApplication::exec();
+    if (!App::CanEnd())
+        app.Leave();
+    return result;
 }

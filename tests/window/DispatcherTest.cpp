@@ -45,6 +45,24 @@ TEST_F(DispatcherTest, RunsOneAfterTheOtherInTheQueuesOrder) {
     EXPECT_FALSE(dispatcher.IsWorking());
 }
 
+TEST_F(DispatcherTest, ReplacesNothingThatTheQueueHasMade) {
+    Add({"1", "2"});
+    WriteFile(folder / "out.mp4", "the user's");
+    for (const int row : {0, 1}) {
+        queue.SetTarget(Id(row), folder / "out.mp4");
+        queue.SetReplace(Id(row), true);
+    }
+    AwaitExamined();
+    dispatcher.Start();
+    ASSERT_TRUE(AwaitScripts(1));
+    EXPECT_TRUE(Script(0).order.replace);
+    Script(0).End(Ending::kDone);
+    ASSERT_TRUE(AwaitScripts(2));
+    EXPECT_FALSE(Script(1).order.replace);
+    Script(1).End(Ending::kFailed);
+    ASSERT_TRUE(AwaitEnd());
+}
+
 TEST_F(DispatcherTest, RunsEightAtOnceAndMoreWhenAllowedMore) {
     std::vector<std::string> names;
     for (int i = 0; i < 10; ++i)

@@ -42,6 +42,19 @@ TEST(Queue, GivesEveryEntryATargetOfItsOwn) {
     EXPECT_EQ(targets.size(), 3U);
 }
 
+TEST(Queue, GivesClipsANameOfTheirOwn) {
+    Bench bench;
+    WriteFile(bench.folder / "a_00.mp4", "a clip of the user's");
+    WriteFile(bench.folder / "b.mp4", "which clips do not touch");
+    bench.Add({"a.avi", "b.avi"});
+    Wishes wishes;
+    wishes.clip = 60;
+    bench.queue.SetWishesOfAll(wishes);
+    bench.AwaitExamined();
+    EXPECT_EQ(bench.At(0).target, bench.folder / "a (2).mp4");
+    EXPECT_EQ(bench.At(1).target, bench.folder / "b.mp4");
+}
+
 TEST(Queue, FollowsEditsAndNamingUntilTheUserNamesTheTarget) {
     Bench bench;
     bench.Add({"a.avi", "b.avi"});
@@ -59,6 +72,36 @@ TEST(Queue, FollowsEditsAndNamingUntilTheUserNamesTheTarget) {
     bench.queue.SetTarget(bench.Id(1), bench.Movie("there.mp4"));
     bench.AwaitExamined();
     EXPECT_EQ(bench.At(1).findings.warnings.size(), 1);
+}
+
+TEST(Queue, TellsWhereSeveralMoviesGoToOneFile) {
+    Bench bench;
+    bench.Add({"a.avi", "b.avi", "c.avi"});
+    const auto shared = [&] {
+        std::vector<bool> all;
+        for (const Entry& entry : bench.queue.Entries())
+            all.push_back(entry.targetShared);
+        return all;
+    };
+    using Shared = std::vector<bool>;
+    bench.queue.SetTarget(bench.Id(0), bench.folder / "c.mp4");
+    EXPECT_EQ(bench.At(2).target, bench.folder / "c (2).mp4") << "which was not named";
+    EXPECT_EQ(shared(), (Shared{false, false, false}));
+    bench.queue.SetTarget(bench.Id(1), bench.folder / "c.mp4");
+    EXPECT_EQ(shared(), (Shared{true, true, false}));
+    bench.AwaitExamined();
+    EXPECT_EQ(shared(), (Shared{true, true, false}));
+    bench.journal.Settle();
+    Journal journal(bench.folder / "queue", [](const QString&) {});
+    Queue again(bench.runner, journal);
+    again.Restore();
+    EXPECT_TRUE(again.Entries().at(0).targetShared);
+    bench.queue.SetTarget(bench.Id(0), {});
+    EXPECT_EQ(shared(), (Shared{false, false, false}));
+    bench.queue.SetTarget(bench.Id(0), bench.At(1).target);
+    bench.queue.Remove({bench.Id(0)});
+    EXPECT_EQ(shared(), (Shared{false, false}));
+    bench.AwaitExamined();
 }
 
 TEST(Queue, MovesAndRemoves) {

@@ -1,13 +1,20 @@
 // What the window's runner makes of presets and wishes.
 #include "host/convert/Formats.h"
+#include "host/window/runner/Foresight.h"
 #include "host/window/runner/PresetShelf.h"
 #include "host/window/runner/Translation.h"
 #include "tests/support/Folder.h"
 
 #include <gtest/gtest.h>
 
+#include <QJsonDocument>
+#include <QJsonObject>
+#include <QSet>
+
 #include <algorithm>
 #include <cstdlib>
+#include <functional>
+#include <iterator>
 
 using namespace movieconv::window;
 
@@ -120,6 +127,12 @@ TEST_F(RunnerTest, AsksTheLibraryForWhatIsWished) {
     EXPECT_EQ(request.size->width, 864);
     EXPECT_EQ(request.crop.top + request.crop.bottom, 280);
     EXPECT_FALSE(request.detectCrop);
+    wishes.height = 1080; // the source's, which what is left does not have any more
+    request = ToRequest(OrderOf(wishes, "out.webm"));
+    ASSERT_TRUE(request.size);
+    EXPECT_EQ(request.size->height, 1080);
+    wishes.height = 800;
+    EXPECT_FALSE(ToRequest(OrderOf(wishes, "out.webm")).size) << "what is left has just that";
 
     EXPECT_TRUE(ToRequest(OrderOf({}, "out.mp3")).noVideo);
     Wishes lost;
@@ -207,6 +220,85 @@ TEST_F(RunnerTest, SavesWishesAsAPresetAndTakesThemBack) {
     EXPECT_EQ(movieconv::LoadPreset("mine").preferences.frameRate, 24);
 
     EXPECT_THROW(WritePreset("/proc/none/x.json", wishes), movieconv::PresetError);
+}
+
+TEST_F(RunnerTest, SavesAPresetWithAllElseThatItsParentSays) {
+    const struct {
+        std::function<void(Wishes&)> wish;
+        const char* group;
+        const char* member;
+        QJsonValue value;
+    } cases[] = {{[](Wishes& wishes) { wishes.rate = 24; }, "video", "frame_rate", 24},
+                 {[](Wishes& wishes) { wishes.height = 360; }, "video", "fit_within", "32768x360"},
+                 {[](Wishes& wishes) { wishes.channels = 1; }, "audio", "channels", 1},
+                 {[](Wishes& wishes) { wishes.withSound = false; }, "audio", "leave_out", true},
+                 {[](Wishes& wishes) { wishes.withPictures = false; }, "video", "leave_out", true}};
+    const auto read = [](const std::string& name) {
+        QJsonObject json =
+            QJsonDocument::fromJson(QByteArray::fromStdString(movieconv::LoadPreset(name).text)).object();
+        json.remove("description");
+        return json;
+    };
+    for (const PresetFacts& facts : PresetsOnShelf()) {
+        for (const auto& [wish, group, member, value] : cases) {
+            Wishes wishes;
+            wishes.preset = facts.name;
+            wish(wishes);
+            WritePreset(Own("mine"), wishes);
+            QJsonObject expected = read(facts.name.toStdString());
+            QJsonObject part = expected.value(group).toObject();
+            part[QLatin1String(member)] = value;
+            expected[QLatin1String(group)] = part;
+            EXPECT_EQ(read("mine"), expected) << facts.name.toStdString() << ", " << member;
+        }
+        std::filesystem::remove(Own("mine"));
+    }
+}
+
+TEST_F(RunnerTest, TellsWhichWishesPresetsCannotHold) {
+    const std::function<void(Wishes&)> wishes[] = {
+        [](Wishes& wish) { wish.crop = true; },
+        [](Wishes& wish) { wish.deinterlace = Wishes::Deinterlace::kAll; },
+        [](Wishes& wish) { wish.hdr = Wishes::Hdr::kUsual; },
+        [](Wishes& wish) { wish.depth = 8; },
+        [](Wishes& wish) { wish.clip = 60; },
+        [](Wishes& wish) { wish.chapters = false; },
+        [](Wishes& wish) { wish.texts = false; }};
+    Wishes all;
+    EXPECT_TRUE(WritePreset(Own("mine"), all).isEmpty());
+    for (const auto& wish : wishes) {
+        Wishes one;
+        wish(one);
+        EXPECT_EQ(WritePreset(Own("mine"), one).size(), 1);
+        wish(all);
+    }
+    const QStringList names = WritePreset(Own("mine"), all);
+    EXPECT_EQ(QSet<QString>(names.begin(), names.end()).size(), std::ssize(wishes))
+        << names.join(", ").toStdString();
+}
+
+TEST_F(RunnerTest, LooksForTheFilesThatAnOrderWrites) {
+    WriteFile(folder / "whole.mp4", "x");
+    WriteFile(folder / "cut_03.mp4", "x");
+    const struct {
+        const char* target;
+        bool clips;
+        std::string existing;
+    } cases[] = {{"whole.mp4", false, folder / "whole.mp4"},
+                 {"whole.mp4", true, ""},
+                 {"cut.mp4", false, ""},
+                 {"cut.mp4", true, folder / "cut_03.mp4"}};
+    for (const auto& [target, clips, existing] : cases) {
+        Wishes wishes;
+        if (clips)
+            wishes.clip = 60;
+        const Order order = OrderOf(wishes, folder / target);
+        EXPECT_EQ(ExistingFileOf(order), existing) << target;
+        const Findings findings = Foresee(order);
+        EXPECT_EQ(findings.targetExists, !existing.empty()) << target;
+        const QStringList told = findings.warnings.filter(QStringLiteral("already"));
+        EXPECT_EQ(told.size(), existing.empty() ? 0 : 1) << target;
+    }
 }
 
 TEST_F(RunnerTest, TakesAPresetFromElsewhere) {

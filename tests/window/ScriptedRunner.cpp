@@ -2,6 +2,7 @@
 
 #include "tests/support/Folder.h"
 
+#include <filesystem>
 #include <stdexcept>
 
 using namespace movieconv::window;
@@ -101,8 +102,9 @@ PresetFacts ScriptedRunner::LoadPreset(const std::string& path) {
     return Presets().back();
 }
 
-void ScriptedRunner::SavePreset(const std::string& path, const Wishes& wishes) {
+QStringList ScriptedRunner::SavePreset(const std::string& path, const Wishes& wishes) {
     saved[path] = wishes;
+    return unkept;
 }
 
 std::unique_ptr<Run> ScriptedRunner::Start(const Order& order, std::shared_ptr<RunListener> listener) {
@@ -141,9 +143,16 @@ MovieFacts ScriptedRunner::Look(const std::string& path) {
     return facts;
 }
 
+std::string ScriptedRunner::FileInTheWay(const Order& order) {
+    std::filesystem::path file = order.target;
+    if (order.wishes.clip)
+        file.replace_filename(file.stem().string() + "_00" + file.extension().string());
+    return std::filesystem::exists(file) ? file.string() : std::string();
+}
+
 Findings ScriptedRunner::Check(const Order& order) {
     Findings findings;
-    findings.targetExists = !ReadFile(order.target).empty();
+    findings.targetExists = !FileInTheWay(order).empty();
     if (findings.targetExists)
         findings.warnings += QStringLiteral("The target exists.");
     return findings;

@@ -36,7 +36,7 @@ public:
     movieconv::window::Abilities Can() override { return {true, true, true, true}; }
     std::vector<movieconv::window::PresetFacts> Presets() override;
     movieconv::window::PresetFacts LoadPreset(const std::string& path) override;
-    void SavePreset(const std::string& path, const movieconv::window::Wishes& wishes) override;
+    QStringList SavePreset(const std::string& path, const movieconv::window::Wishes& wishes) override;
     std::string PresetFolder() override { return {}; }
     std::vector<movieconv::window::FormatFacts> Formats() override;
     std::unique_ptr<movieconv::window::Run>
@@ -44,6 +44,7 @@ public:
           std::shared_ptr<movieconv::window::RunListener> listener) override;
     /// A file whose text begins with "movie" is one; a number behind it tells its seconds.
     movieconv::window::MovieFacts Look(const std::string& path) override;
+    std::string FileInTheWay(const movieconv::window::Order& order) override;
     movieconv::window::Findings Check(const movieconv::window::Order& order) override;
     QImage PictureAt(const std::string& path, double seconds, int width) override;
 
@@ -52,6 +53,7 @@ public:
     /// Stops as the real ones do: the end comes by itself.
     bool endsWhenStopped = true;
     std::map<std::string, movieconv::window::Wishes> saved; ///< Presets by path.
+    QStringList unkept;                                     ///< What they cannot hold.
     Gate looking;                                           ///< Looks at movies pass it.
     std::atomic<int> looks = 0;
     std::atomic<int> subtitles = 1; ///< How many of them a movie has.

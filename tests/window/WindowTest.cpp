@@ -279,6 +279,11 @@ TEST_F(WindowTest, SavesAndLoadsPresets) {
     Q_EMIT The<QFileDialog>("savePreset")->fileSelected(path);
     The<QFileDialog>("savePreset")->close();
     EXPECT_EQ(runner.saved.at(folder / "own.json"), At(0).wishes);
+    EXPECT_FALSE(Tells("The preset is saved"));
+    runner.unkept = QStringList{"cropping", "HDR"};
+    Click("Save as preset…");
+    Q_EMIT The<QFileDialog>("savePreset")->fileSelected(path);
+    EXPECT_TRUE(Tells("cropping, HDR"));
     Click("Load preset…");
     Q_EMIT The<QFileDialog>("loadPreset")->fileSelected(path);
     EXPECT_EQ(At(0).wishes.preset, "web");

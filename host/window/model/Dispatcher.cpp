@@ -243,7 +243,7 @@ bool Dispatcher::HasMore() const {
 
 void Dispatcher::Begin(const Entry& entry) {
     const quint64 id = entry.id;
-    const Order order{entry.source, entry.target, entry.wishes, entry.replace,
+    const Order order{entry.source, entry.target, entry.wishes, queue_.MayReplace(entry),
                       entry.facts.value_or(MovieFacts{})};
     Active& active = active_[id];
     active.mailbox = std::make_shared<Mailbox>(*this, id);

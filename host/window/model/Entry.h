@@ -23,7 +23,8 @@ struct Entry {
     std::optional<MovieFacts> facts; ///< Nothing until the movie was looked at.
     QString unusable;                ///< Why it cannot be converted; empty when it can, as far as is known.
     Findings findings;
-    bool examined = false; ///< Whether the three above tell of the entry as it is.
+    bool examined = false;     ///< Whether the three above tell of the entry as it is.
+    bool targetShared = false; ///< Another entry in the queue goes there as well.
 
     Figures figures;
     Outcome outcome;

@@ -3,7 +3,10 @@
 #include "text/Path.h"
 #include "text/Utf8.h"
 
+#include <QDir>
+
 #include <algorithm>
+#include <filesystem>
 
 namespace movieconv::window {
 namespace {
@@ -33,6 +36,13 @@ std::string Fill(const Entry& entry, const QString& pattern, const QDate& today)
     return useless ? Stem(entry.source) : name;
 }
 
+/// What stands behind the last point may as well be a part of the name.
+bool HasExtension(const std::string& path, const QStringList& known) {
+    const std::string extension = std::filesystem::path(path).extension().string();
+    return !extension.empty() &&
+           known.contains(QString::fromStdString(extension.substr(1)), Qt::CaseInsensitive);
+}
+
 } // namespace
 
 std::string TargetFor(const Entry& entry, const Naming& naming, const QString& extension, const QDate& today,
@@ -49,6 +59,21 @@ std::string TargetFor(const Entry& entry, const Naming& naming, const QString& e
         ++number;
     } while (isTaken(path));
     return path;
+}
+
+std::string CompletePath(const std::string& typed, const Entry& entry, const QString& extension,
+                         const QStringList& known) {
+    namespace fs = std::filesystem;
+    fs::path path = typed.starts_with("~/") ? QDir::homePath().toStdString() + typed.substr(1) : typed;
+    path = (fs::path(text::FolderOf(entry.source)) / path).lexically_normal();
+    if (!path.has_filename())
+        path /= Stem(entry.source);
+    return HasExtension(path, known) ? path.string() : path.string() + "." + extension.toStdString();
+}
+
+std::string WithExtension(const std::string& path, const QString& extension, const QStringList& known) {
+    const std::string stem = HasExtension(path, known) ? path.substr(0, path.rfind('.')) : path;
+    return stem + "." + extension.toStdString();
 }
 
 } // namespace movieconv::window

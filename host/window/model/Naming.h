@@ -27,6 +27,13 @@ using IsTaken = std::function<bool(const std::string& path)>;
 std::string TargetFor(const Entry& entry, const Naming& naming, const QString& extension, const QDate& today,
                       const IsTaken& isTaken);
 
+/// What the user means by `typed`: beside the source unless a folder is named, with `extension` unless the
+/// name ends in one of `known`.
+std::string CompletePath(const std::string& typed, const Entry& entry, const QString& extension,
+                         const QStringList& known);
+/// With `extension` instead of one of `known`.
+std::string WithExtension(const std::string& path, const QString& extension, const QStringList& known);
+
 } // namespace movieconv::window
 
 #endif

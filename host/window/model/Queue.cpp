@@ -6,19 +6,10 @@
 #include <QSet>
 
 #include <algorithm>
-#include <filesystem>
 #include <stdexcept>
 #include <utility>
 
 namespace movieconv::window {
-namespace {
-
-bool Exists(const std::string& path) {
-    std::error_code unknown;
-    return std::filesystem::exists(std::filesystem::symlink_status(path, unknown));
-}
-
-} // namespace
 
 Queue::Queue(Runner& runner, Journal& journal, QObject* parent)
     : QAbstractListModel(parent), runner_(runner), journal_(journal), presets_(runner.Presets()) {}
@@ -181,22 +172,52 @@ void Queue::SetWishes(quint64 id, const Wishes& wishes) {
     Entry* entry = FindWaiting(id);
     if (entry == nullptr || entry->wishes == wishes)
         return;
+    const Batch batch(*this);
+    const QString before = ExtensionFor(entry->wishes);
     entry->wishes = wishes;
-    if (!entry->targetNamed)
+    if (entry->targetNamed)
+        RenameForFormat(*entry, before);
+    else
         AssignTarget(*entry);
     AfterEdit(id);
 }
 
-void Queue::SetTarget(quint64 id, const std::string& path) {
-    Entry* entry = FindWaiting(id);
-    if (entry == nullptr || (entry->targetNamed && entry->target == path))
+/// The file's format follows its name.
+void Queue::RenameForFormat(Entry& entry, const QString& before) {
+    const QString extension = ExtensionFor(entry.wishes);
+    if (extension == before)
         return;
+    entry.replace = false;
+    MoveTarget(entry, WithExtension(entry.target, extension, KnownExtensions()));
+    MakeRoomFor(entry);
+}
+
+QStringList Queue::KnownExtensions() const {
+    QStringList known = MovieExtensions();
+    for (const FormatFacts& format : runner_.Formats())
+        known += format.extension;
+    return known;
+}
+
+void Queue::SetTarget(quint64 id, const std::string& typed) {
+    Entry* entry = FindWaiting(id);
+    if (entry == nullptr)
+        return;
+    const std::string path =
+        typed.empty() ? std::string()
+                      : CompletePath(typed, *entry, ExtensionFor(entry->wishes), KnownExtensions());
+    if (entry->targetNamed && entry->target == path)
+        return Change(
+            id, [](Entry&) {}, false); // it may be shown as it was typed
+    const Batch batch(*this);
     entry->targetNamed = !path.empty();
     entry->replace = false;
-    entry->target = path;
     if (path.empty())
         AssignTarget(*entry);
+    else
+        MoveTarget(*entry, path);
     AfterEdit(id);
+    MakeRoomFor(*entry);
 }
 
 void Queue::SetReplace(quint64 id, bool replace) {
@@ -328,11 +349,11 @@ void Queue::Examine(quint64 id) {
     const Batch batch(*this); // perhaps within another one
 }
 
-void Queue::ExamineAmong(const std::shared_ptr<const Targets>& targets, quint64 id) {
+void Queue::ExamineAmong(const std::shared_ptr<const TargetBook>& book, quint64 id) {
     const Entry* entry = Find(id);
     if (entry == nullptr)
         return;
-    worker_.Do(id, [this, targets, seen = *entry, naming = naming_, extension = ExtensionFor(entry->wishes),
+    worker_.Do(id, [this, book, seen = *entry, naming = naming_, extension = ExtensionFor(entry->wishes),
                     today = QDate::currentDate()] {
         Entry found = seen;
         try {
@@ -340,8 +361,9 @@ void Queue::ExamineAmong(const std::shared_ptr<const Targets>& targets, quint64 
                 found.facts = runner_.Look(found.source);
             if (!found.targetNamed && found.state == State::kWaiting) {
                 found.target = TargetFor(found, naming, extension, today, [&](const std::string& path) {
-                    const int own = path == seen.target ? 1 : 0;
-                    return CountOf(*targets, path) > own || Exists(path);
+                    return book->IsTaken(path, seen) ||
+                           !runner_.FileInTheWay({found.source, path, found.wishes, false, *found.facts})
+                                .empty();
                 });
             }
             found.findings =
@@ -359,7 +381,7 @@ void Queue::TakeFound(const Entry& seen, const Entry& found) {
     if (now == nullptr || now->state != seen.state || now->wishes != seen.wishes ||
         now->target != seen.target || now->replace != seen.replace)
         return; // edited meanwhile, and so examined again
-    if (!found.targetNamed && IsTakenByOther(*now, found.target)) {
+    if (!found.targetNamed && TargetBook(entries_).IsTaken(found.target, *now)) {
         Examine(seen.id);
         return;
     }
@@ -379,30 +401,42 @@ void Queue::TakeFound(const Entry& seen, const Entry& found) {
 void Queue::AssignTarget(Entry& entry) {
     const Batch batch(*this);
     if (!taken_)
-        taken_ = CountTargets();
-    if (const auto own = taken_->find(entry.target); own != taken_->end())
-        --own->second;
-    entry.target = TargetFor(
-        entry, naming_, ExtensionFor(entry.wishes), QDate::currentDate(),
-        [&](const std::string& path) { return path == entry.source || CountOf(*taken_, path) > 0; });
-    ++(*taken_)[entry.target];
+        taken_.emplace(entries_);
+    MoveTarget(entry, TargetFor(entry, naming_, ExtensionFor(entry.wishes), QDate::currentDate(),
+                                [&](const std::string& path) { return taken_->IsTaken(path, entry); }));
 }
 
-Queue::Targets Queue::CountTargets() const {
-    Targets targets;
-    for (const Entry& entry : entries_)
-        ++targets[entry.target];
-    return targets;
+void Queue::MoveTarget(Entry& entry, const std::string& path) {
+    if (taken_)
+        taken_->Move(entry.target, path);
+    entry.target = path;
 }
 
-int Queue::CountOf(const Targets& targets, const std::string& path) {
-    const auto found = targets.find(path);
-    return found == targets.end() ? 0 : found->second;
+/// A name that the user gives one movie is not another one's by the rules any more.
+void Queue::MakeRoomFor(const Entry& named) {
+    for (Entry& other : entries_) {
+        if (other.id == named.id || other.targetNamed || other.state != State::kWaiting ||
+            other.target != named.target)
+            continue;
+        AssignTarget(other);
+        AfterEdit(other.id);
+    }
 }
 
-bool Queue::IsTakenByOther(const Entry& entry, const std::string& path) const {
-    return std::any_of(entries_.begin(), entries_.end(),
-                       [&](const Entry& other) { return other.id != entry.id && other.target == path; });
+void Queue::MarkShared() {
+    const TargetBook book(entries_);
+    for (const Entry& entry : entries_) {
+        const bool shared = book.IsShared(entry.target);
+        if (entry.targetShared != shared)
+            Change(
+                entry.id, [shared](Entry& known) { known.targetShared = shared; }, false);
+    }
+}
+
+bool Queue::MayReplace(const Entry& entry) const {
+    return entry.replace && std::none_of(entries_.begin(), entries_.end(), [&](const Entry& other) {
+               return other.id != entry.id && other.target == entry.target && !other.outcome.files.empty();
+           });
 }
 
 void Queue::Keep() {
@@ -422,10 +456,11 @@ Queue::Batch::~Batch() {
     if (std::exchange(queue_.keepAfter_, false))
         queue_.journal_.Keep(queue_.entries_);
     if (const QList<quint64> ids = std::exchange(queue_.examineAfter_, {}); !ids.isEmpty()) {
-        const auto targets = std::make_shared<const Targets>(queue_.CountTargets());
+        const auto book = std::make_shared<const TargetBook>(queue_.entries_);
         for (const quint64 id : ids)
-            queue_.ExamineAmong(targets, id);
+            queue_.ExamineAmong(book, id);
     }
+    queue_.MarkShared();
     if (std::exchange(queue_.tellAfter_, false))
         Q_EMIT queue_.Rearranged();
 }

@@ -5,6 +5,7 @@
 #include "host/window/model/Inbox.h"
 #include "host/window/model/Journal.h"
 #include "host/window/model/Naming.h"
+#include "host/window/model/TargetBook.h"
 #include "host/window/model/Worker.h"
 
 #include <QAbstractListModel>
@@ -13,7 +14,6 @@
 #include <memory>
 #include <optional>
 #include <string>
-#include <unordered_map>
 #include <vector>
 
 namespace movieconv::window {
@@ -54,9 +54,12 @@ public:
 
     /// Change an entry that is waiting; others are left alone.
     void SetWishes(quint64 id, const Wishes& wishes);
-    /// An empty path goes back to the naming rules.
-    void SetTarget(quint64 id, const std::string& path);
+    /// What the user calls it: a name alone is beside the source, a missing extension is the format's. An
+    /// empty path goes back to the naming rules.
+    void SetTarget(quint64 id, const std::string& typed);
     void SetReplace(quint64 id, bool replace);
+    /// Whether it replaces a file that exists: where that is wished, but for what another entry has become.
+    bool MayReplace(const Entry& entry) const;
     /// Gives all that wait these wishes, but for what belongs to one movie alone.
     void SetWishesOfAll(const Wishes& wishes);
     /// Finds out anew whether a movie that could not be converted can be now.
@@ -95,8 +98,6 @@ Q_SIGNALS:
     void Complaint(const QString& sentence);
 
 private:
-    using Targets = std::unordered_map<std::string, int>; ///< How many entries have each.
-
     /// Makes many changes one: when it ends, the journal is written once, Rearranged is told once, and all
     /// that have to be are examined.
     class Batch {
@@ -113,17 +114,19 @@ private:
     void Append(const std::vector<std::string>& movies);
     void RemoveRows(int first, int last);
     void Examine(quint64 id);
-    void ExamineAmong(const std::shared_ptr<const Targets>& targets, quint64 id);
+    void ExamineAmong(const std::shared_ptr<const TargetBook>& book, quint64 id);
     void TakeFound(const Entry& seen, const Entry& found);
     void AssignTarget(Entry& entry);
-    Targets CountTargets() const;
-    static int CountOf(const Targets& targets, const std::string& path);
+    void RenameForFormat(Entry& entry, const QString& before);
+    QStringList KnownExtensions() const;
+    void MoveTarget(Entry& entry, const std::string& path);
+    void MakeRoomFor(const Entry& named);
+    void MarkShared();
     void Keep();
     void TellRearranged();
     const PresetFacts* FindPreset(const QString& name) const;
     Entry* FindWaiting(quint64 id);
     void AfterEdit(quint64 id);
-    bool IsTakenByOther(const Entry& entry, const std::string& path) const;
 
     Runner& runner_;
     Journal& journal_;
@@ -135,7 +138,7 @@ private:
     int searches_ = 0;
     int batches_ = 0;
     /// While a batch gives out new ones.
-    std::optional<Targets> taken_;
+    std::optional<TargetBook> taken_;
     bool keepAfter_ = false; // these three: when the batch ends
     bool tellAfter_ = false;
     QList<quint64> examineAfter_;

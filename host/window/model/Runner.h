@@ -171,7 +171,8 @@ public:
     /// These read or write a small file. What was loaded is among Presets() from then on. Throw
     /// std::runtime_error with a sentence for people.
     virtual PresetFacts LoadPreset(const std::string& path) = 0;
-    virtual void SavePreset(const std::string& path, const Wishes& wishes) = 0;
+    /// Gives the names of those wishes for any movie that it cannot keep.
+    virtual QStringList SavePreset(const std::string& path, const Wishes& wishes) = 0;
     /// Where the user's own are kept; what is there is among Presets(). May be empty.
     virtual std::string PresetFolder() = 0;
 
@@ -181,6 +182,8 @@ public:
     /// These read the disk and may take long; they are called on threads of their own. Throw
     /// std::runtime_error with a sentence for people.
     virtual MovieFacts Look(const std::string& path) = 0;
+    /// A file that exists already and that the order would write; empty when there is none.
+    virtual std::string FileInTheWay(const Order& order) = 0;
     virtual Findings Check(const Order& order) = 0;
     /// The picture nearest before `seconds`, at most `width` pixels wide; null when there is none.
     virtual QImage PictureAt(const std::string& path, double seconds, int width) = 0;

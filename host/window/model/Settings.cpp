@@ -14,6 +14,7 @@ const QString kAtOnce = QStringLiteral("at_once");
 const QString kSound = QStringLiteral("at_end/sound");
 const QString kThen = QStringLiteral("at_end/then");
 const QString kGeometry = QStringLiteral("window/geometry");
+const QString kSplitter = QStringLiteral("window/splitter");
 const QString kSourceFolder = QStringLiteral("window/folder");
 
 } // namespace
@@ -68,12 +69,24 @@ void Settings::SaveGeometry(const QByteArray& geometry) {
     settings_.setValue(kGeometry, geometry);
 }
 
+QByteArray Settings::LoadSplitter() const {
+    return settings_.value(kSplitter).toByteArray();
+}
+
+void Settings::SaveSplitter(const QByteArray& state) {
+    settings_.setValue(kSplitter, state);
+}
+
 QString Settings::LoadFolder() const {
     return settings_.value(kSourceFolder).toString();
 }
 
 void Settings::SaveFolder(const QString& folder) {
     settings_.setValue(kSourceFolder, folder);
+}
+
+void Settings::Settle() {
+    settings_.sync();
 }
 
 } // namespace movieconv::window

@@ -32,8 +32,12 @@ public:
     void Save(const AtEnd& atEnd);
     QByteArray LoadGeometry() const;
     void SaveGeometry(const QByteArray& geometry);
+    QByteArray LoadSplitter() const;
+    void SaveSplitter(const QByteArray& state);
     QString LoadFolder() const; ///< Where movies were opened last.
     void SaveFolder(const QString& folder);
+    /// Writes what is not written yet.
+    void Settle();
 
 private:
     QSettings settings_;

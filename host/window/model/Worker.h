@@ -4,6 +4,7 @@
 
 #include <QObject>
 
+#include <chrono>
 #include <condition_variable>
 #include <deque>
 #include <functional>
@@ -28,6 +29,10 @@ public:
 
     /// Drops what has not begun.
     void Forget();
+
+    /// Waits until no worker of the program has anything to do. False when that is not so after `most`: what
+    /// waits for a disk or a network may never return, and neither would the worker's end.
+    static bool AwaitAll(std::chrono::milliseconds most);
 
 private:
     void Run();

@@ -198,8 +198,8 @@ PresetFacts ConvertRunner::LoadPreset(const std::string& path) {
     }
 }
 
-void ConvertRunner::SavePreset(const std::string& path, const Wishes& wishes) {
-    WritePreset(path, wishes);
+QStringList ConvertRunner::SavePreset(const std::string& path, const Wishes& wishes) {
+    return WritePreset(path, wishes);
 }
 
 std::string ConvertRunner::PresetFolder() {
@@ -227,6 +227,10 @@ MovieFacts ConvertRunner::Look(const std::string& path) {
     } catch (const Failure& failure) {
         throw std::runtime_error(FailureSentence(failure, path).toStdString());
     }
+}
+
+std::string ConvertRunner::FileInTheWay(const Order& order) {
+    return ExistingFileOf(order);
 }
 
 Findings ConvertRunner::Check(const Order& order) {

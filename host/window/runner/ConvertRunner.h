@@ -14,10 +14,11 @@ public:
     std::vector<PresetFacts> Presets() override;
     std::vector<FormatFacts> Formats() override;
     PresetFacts LoadPreset(const std::string& path) override;
-    void SavePreset(const std::string& path, const Wishes& wishes) override;
+    QStringList SavePreset(const std::string& path, const Wishes& wishes) override;
     std::string PresetFolder() override;
     std::unique_ptr<Run> Start(const Order& order, std::shared_ptr<RunListener> listener) override;
     MovieFacts Look(const std::string& path) override;
+    std::string FileInTheWay(const Order& order) override;
     Findings Check(const Order& order) override;
     QImage PictureAt(const std::string& path, double seconds, int width) override;
 

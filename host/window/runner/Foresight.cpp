@@ -3,6 +3,7 @@
 #include "host/convert/CarryPlan.h"
 #include "host/convert/EncodePlan.h"
 #include "host/convert/Failure.h"
+#include "host/convert/OutputCheck.h"
 #include "host/convert/Room.h"
 #include "host/convert/Sources.h"
 #include "host/presets/Preset.h"
@@ -16,6 +17,7 @@
 #include <QCoreApplication>
 
 #include <filesystem>
+#include <map>
 #include <system_error>
 #include <unistd.h>
 
@@ -29,10 +31,13 @@ struct ForesightTexts {
 void WarnOfTarget(Findings& findings, const Order& order) {
     namespace fs = std::filesystem;
     std::error_code unknown;
-    findings.targetExists = fs::exists(fs::symlink_status(order.target, unknown));
-    if (findings.targetExists && fs::equivalent(order.source, order.target, unknown))
+    const std::string existing = ExistingFileOf(order);
+    findings.targetExists = !existing.empty();
+    if (findings.targetExists && fs::equivalent(order.source, existing, unknown))
         findings.warnings +=
             ForesightTexts::tr("The new file cannot take the place of its source. Choose another name.");
+    else if (findings.targetExists && !order.replace && existing != order.target)
+        findings.warnings += ForesightTexts::tr("There is a file “%1” already.").arg(NameOf(existing));
     else if (findings.targetExists && !order.replace)
         findings.warnings += ForesightTexts::tr("There is a file of this name already.");
     else if (findings.targetExists)
@@ -93,6 +98,17 @@ void WarnOfRoom(Findings& findings, const Order& order, const Request& request, 
 }
 
 } // namespace
+
+/// A movie that is cut into clips becomes files with a number in their names, and none without.
+std::string ExistingFileOf(const Order& order) {
+    if (order.wishes.clip) {
+        const std::map<int, std::string> clips = ClipsOf(order.target);
+        return clips.empty() ? std::string() : clips.begin()->second;
+    }
+    std::error_code unknown;
+    const bool exists = std::filesystem::exists(std::filesystem::symlink_status(order.target, unknown));
+    return exists ? order.target : std::string();
+}
 
 Findings Foresee(const Order& order) {
     Findings findings;

@@ -9,6 +9,9 @@ namespace movieconv::window {
 /// Reads the disk. Of facts that do not come from FactsOf, less can be told.
 Findings Foresee(const Order& order);
 
+/// Of the files that the order writes, the first that exists; empty when none does.
+std::string ExistingFileOf(const Order& order);
+
 } // namespace movieconv::window
 
 #endif

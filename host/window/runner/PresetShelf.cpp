@@ -18,6 +18,7 @@
 #include <array>
 #include <cmath>
 #include <filesystem>
+#include <utility>
 
 namespace movieconv::window {
 namespace {
@@ -164,7 +165,7 @@ void PutPictures(QJsonObject& video, const Preset& preset, const Wishes& wishes)
         codec && wishes.quality ? LadderOf(preset, *codec, *wishes.quality) : QJsonObject();
     if (ladder.isEmpty())
         return;
-    QJsonObject qualities = video[QStringLiteral("quality")].toObject();
+    QJsonObject qualities = video.value(QStringLiteral("quality")).toObject();
     qualities[QString::fromStdString(CodeName(*codec))] = ladder;
     video[QStringLiteral("quality")] = qualities;
 }
@@ -178,6 +179,23 @@ void PutSound(QJsonObject& audio, const Preset& preset, const Wishes& wishes) {
         audio[QStringLiteral("channels")] = *wishes.channels;
     if (!wishes.withSound)
         audio[QStringLiteral("leave_out")] = true;
+}
+
+/// Wishes for any movie that presets have no words for.
+QStringList BeyondPresets(const Wishes& wishes) {
+    const std::pair<bool, const char*> all[] = {
+        {wishes.crop, QT_TRANSLATE_NOOP("Presets", "cropping")},
+        {wishes.deinterlace != Wishes::Deinterlace::kAuto, QT_TRANSLATE_NOOP("Presets", "deinterlacing")},
+        {wishes.hdr != Wishes::Hdr::kAuto, QT_TRANSLATE_NOOP("Presets", "HDR")},
+        {wishes.depth.has_value(), QT_TRANSLATE_NOOP("Presets", "colour depth")},
+        {wishes.clip.has_value(), QT_TRANSLATE_NOOP("Presets", "length of clips")},
+        {!wishes.chapters, QT_TRANSLATE_NOOP("Presets", "leaving chapters out")},
+        {!wishes.texts, QT_TRANSLATE_NOOP("Presets", "leaving texts out")}};
+    QStringList names;
+    for (const auto& [wished, name] : all)
+        if (wished)
+            names += QCoreApplication::translate("Presets", name);
+    return names;
 }
 
 /// What all that the preset says comes to, without a parent.
@@ -238,7 +256,7 @@ PresetFacts TakeIntoShelf(const std::string& path) {
     return FactsOf(preset);
 }
 
-void WritePreset(const std::string& path, const Wishes& wishes) {
+QStringList WritePreset(const std::string& path, const Wishes& wishes) {
     const std::string parent = wishes.preset.toStdString();
     const Preset preset = movieconv::LoadPreset(parent);
     // One that is changed cannot be its own parent.
@@ -249,8 +267,9 @@ void WritePreset(const std::string& path, const Wishes& wishes) {
         QCoreApplication::translate("Presets", "Made of “%1”.").arg(wishes.preset);
     if (const FileFormatInfo* format = wishes.format ? FindFormat(wishes.format->toStdString()) : nullptr)
         json[QStringLiteral("format")] = QString::fromStdString(CodeName(format->fccFormat)).toLower();
-    QJsonObject video = json[QStringLiteral("video")].toObject();
-    QJsonObject audio = json[QStringLiteral("audio")].toObject();
+    // Asked for by [], what is missing would come in as null, which takes the parent's away.
+    QJsonObject video = json.value(QStringLiteral("video")).toObject();
+    QJsonObject audio = json.value(QStringLiteral("audio")).toObject();
     PutPictures(video, preset, wishes);
     PutSound(audio, preset, wishes);
     if (!video.isEmpty())
@@ -258,6 +277,7 @@ void WritePreset(const std::string& path, const Wishes& wishes) {
     if (!audio.isEmpty())
         json[QStringLiteral("audio")] = audio;
     WriteFile(path, QJsonDocument(json).toJson());
+    return BeyondPresets(wishes);
 }
 
 std::optional<double> QualityOf(const Preset& preset, uint32_t codec, int height, int wish) {

@@ -18,8 +18,9 @@ std::vector<PresetFacts> PresetsOnShelf();
 /// Takes a file among the user's own, with all that its parents say. Throws PresetError.
 PresetFacts TakeIntoShelf(const std::string& path);
 
-/// Writes what `wishes` make of their preset, without what belongs to one movie alone. Throws PresetError.
-void WritePreset(const std::string& path, const Wishes& wishes);
+/// Writes what `wishes` make of their preset, without what belongs to one movie alone. Gives the names of the
+/// wishes that presets have no words for. Throws PresetError.
+QStringList WritePreset(const std::string& path, const Wishes& wishes);
 
 /// What the window's 0 to 100 stand for in pictures of that height, on the codec's own scale; the preset's
 /// own place on the window's scale gives the preset's own quality. Nothing when the preset tells none.

@@ -88,10 +88,11 @@ void AskForPictures(Request& request, const FileFormatInfo& format, const Preset
                     const Order& order) {
     const Wishes& wishes = order.wishes;
     const MovieFacts& facts = order.facts;
+    const Margins cut = wishes.cut.value_or(Margins{});
     if (wishes.height && wishes.crop && !wishes.cut) // the shape is not known yet
         request.preferences.fitWithin = {kWidest, *wishes.height};
-    else if (wishes.height && *wishes.height != facts.height)
-        request.size = ScaledTo(*wishes.height, facts, wishes.cut.value_or(Margins{}));
+    else if (wishes.height && *wishes.height != facts.height - cut.top - cut.bottom)
+        request.size = ScaledTo(*wishes.height, facts, cut);
     request.frameRate = wishes.rate;
     request.deinterlace = ToLibrary(wishes.deinterlace);
     request.detectCrop = wishes.crop && !wishes.cut;

@@ -93,6 +93,10 @@
         <source>You may not write to the folder “%1”.</source>
         <translation>In den Ordner „%1“ darf nicht geschrieben werden.</translation>
     </message>
+    <message>
+        <source>There is a file “%1” already.</source>
+        <translation>Eine Datei „%1“ gibt es schon.</translation>
+    </message>
 </context>
 <context>
     <name>FormParts</name>
@@ -1267,6 +1271,34 @@
         <source>Made of “%1”.</source>
         <translation>Aus „%1“ gemacht.</translation>
     </message>
+    <message>
+        <source>cropping</source>
+        <translation>Beschneiden</translation>
+    </message>
+    <message>
+        <source>deinterlacing</source>
+        <translation>Zeilensprung entfernen</translation>
+    </message>
+    <message>
+        <source>HDR</source>
+        <translation>HDR</translation>
+    </message>
+    <message>
+        <source>colour depth</source>
+        <translation>Farbtiefe</translation>
+    </message>
+    <message>
+        <source>length of clips</source>
+        <translation>Länge der Clips</translation>
+    </message>
+    <message>
+        <source>leaving chapters out</source>
+        <translation>Kapitel weglassen</translation>
+    </message>
+    <message>
+        <source>leaving texts out</source>
+        <translation>Texte weglassen</translation>
+    </message>
 </context>
 <context>
     <name>Words</name>
@@ -1412,6 +1444,33 @@
     <message>
         <source>Draw subtitles</source>
         <translation>Untertitel ins Bild zeichnen</translation>
+    </message>
+</context>
+<context>
+    <name>movieconv::window::Closing</name>
+    <message>
+        <source>Movies are being converted. What is converted so far can be kept as it is.</source>
+        <translation>Es werden gerade Filme umgewandelt. Was bisher fertig ist, kann behalten werden.</translation>
+    </message>
+    <message>
+        <source>Stop and close</source>
+        <translation>Abbrechen und schließen</translation>
+    </message>
+    <message>
+        <source>Close when done</source>
+        <translation>Schließen, wenn fertig</translation>
+    </message>
+    <message>
+        <source>Go on</source>
+        <translation>Weitermachen</translation>
+    </message>
+    <message>
+        <source>Waiting until all is stopped. A disk or a network that does not answer holds this up.</source>
+        <translation>Es wird gewartet, bis alles abgebrochen ist. Ein Laufwerk oder Netz, das nicht antwortet, hält das auf.</translation>
+    </message>
+    <message>
+        <source>Close at once</source>
+        <translation>Sofort schließen</translation>
     </message>
 </context>
 <context>
@@ -1737,22 +1796,6 @@
         <translation>Der Datenträger mit „%1“ ist voll. Sobald Platz ist, geht die Umwandlung von selbst weiter; oder abbrechen und behalten, was fertig ist.</translation>
     </message>
     <message>
-        <source>Movies are being converted. What is converted so far can be kept as it is.</source>
-        <translation>Es werden gerade Filme umgewandelt. Was bisher fertig ist, kann behalten werden.</translation>
-    </message>
-    <message>
-        <source>Stop and close</source>
-        <translation>Abbrechen und schließen</translation>
-    </message>
-    <message>
-        <source>Close when done</source>
-        <translation>Schließen, wenn fertig</translation>
-    </message>
-    <message>
-        <source>Go on</source>
-        <translation>Weitermachen</translation>
-    </message>
-    <message>
         <source>“%1” is not a file on this machine.</source>
         <translation>„%1“ ist keine Datei auf diesem Rechner.</translation>
     </message>
@@ -1960,12 +2003,8 @@
         <translation>schließt danach</translation>
     </message>
     <message>
-        <source>Waiting until all is stopped. A disk or a network that does not answer holds this up.</source>
-        <translation>Es wird gewartet, bis alles abgebrochen ist. Ein Laufwerk oder Netz, das nicht antwortet, hält das auf.</translation>
-    </message>
-    <message>
-        <source>Close at once</source>
-        <translation>Sofort schließen</translation>
+        <source>The preset is saved without what presets cannot hold: %1.</source>
+        <translation>Die Vorlage ist gespeichert, aber ohne das, was Vorlagen nicht enthalten können: %1.</translation>
     </message>
 </context>
 <context>
@@ -2341,6 +2380,10 @@
     <message>
         <source>Save as</source>
         <translation>Speichern als</translation>
+    </message>
+    <message>
+        <source>Another movie in the queue goes there as well. Choose another name.</source>
+        <translation>Ein anderer Film der Warteschlange geht auch dorthin. Bitte einen anderen Namen wählen.</translation>
     </message>
 </context>
 <context>

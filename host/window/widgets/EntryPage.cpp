@@ -34,13 +34,13 @@ int HeightOfTick() {
 } // namespace
 
 EntryPage::EntryPage(Runner& runner, QWidget* parent)
-    : QWidget(parent), runner_(runner), abilities_(runner.Can()), body_(new QWidget) {
+    : QWidget(parent), runner_(runner), abilities_(runner.Can()), page_(new QWidget), body_(new QWidget) {
     auto* scroll = new QScrollArea;
     scroll->setWidgetResizable(true);
     scroll->setFrameShape(QFrame::NoFrame);
     scroll->setHorizontalScrollBarPolicy(Qt::ScrollBarAlwaysOff);
-    auto* page = new QWidget;
-    auto* layout = new QVBoxLayout(page);
+    scroll->setFocusPolicy(Qt::NoFocus); // it follows what has the focus
+    auto* layout = new QVBoxLayout(page_);
     layout->setContentsMargins(24, 20, 24, 16);
     layout->setSpacing(14);
     layout->addLayout(MakeHead());
@@ -51,8 +51,9 @@ EntryPage::EntryPage(Runner& runner, QWidget* parent)
     more_ = new MoreSettings;
     body->addWidget(more_);
     body->addLayout(MakeFoot());
-    scroll->setWidget(page);
+    scroll->setWidget(page_);
     MakeColumn(*this, 0)->addWidget(scroll);
+    LeaveWheelToPageBelow(*page_);
     FillPresets();
     FillChoices();
     Connect();
@@ -281,12 +282,19 @@ void EntryPage::Show(const Entry& entry) {
     body_->setVisible(entry.unusable.isEmpty());
     ShowWishes();
     target_->Show(entry);
+    OrderTabs(*page_);
     filling_ = false;
+}
+
+void EntryPage::Commit() {
+    range_->Commit();
+    target_->Commit();
 }
 
 void EntryPage::ShowWishes() {
     const Wishes& wishes = entry_.wishes;
-    ChooseItem(*preset_, wishes.preset);
+    preset_->setCurrentIndex(preset_->findData(wishes.preset));
+    preset_->setPlaceholderText(wishes.preset); // of one that is gone
     const PresetFacts* preset = CurrentPreset();
     description_->setText(preset != nullptr ? preset->description : QString());
     description_->setToolTip(description_->text()); // a narrow window cuts it

@@ -30,6 +30,8 @@ public:
     explicit EntryPage(Runner& runner, QWidget* parent = nullptr);
 
     void Show(const Entry& entry);
+    /// Takes what is typed and not yet told: keys and menus leave a field without its knowing.
+    void Commit();
     /// The presets there are now.
     void FillPresets();
 
@@ -69,6 +71,7 @@ private:
     QLabel* facts_;
     QLabel* unusable_;
     QPushButton* look_;
+    QWidget* page_; // which is scrolled
     QWidget* body_;
     QComboBox* preset_;
     QLabel* description_;

@@ -3,8 +3,11 @@
 #include "host/window/model/Entry.h"
 #include "text/Path.h"
 
+#include <QAbstractSpinBox>
 #include <QCoreApplication>
+#include <QEvent>
 #include <QFileDialog>
+#include <QSlider>
 
 namespace movieconv::window {
 namespace {
@@ -13,7 +16,49 @@ struct Texts {
     Q_DECLARE_TR_FUNCTIONS(FormParts)
 };
 
+class WheelGuard : public QObject {
+public:
+    using QObject::QObject;
+
+    bool eventFilter(QObject* watched, QEvent* event) override {
+        if (event->type() != QEvent::Wheel || static_cast<QWidget*>(watched)->hasFocus())
+            return false;
+        event->ignore(); // and so it comes to the page
+        return true;
+    }
+};
+
+void CollectControls(const QLayout& layout, QList<QWidget*>& controls) {
+    for (int i = 0; i < layout.count(); ++i) {
+        QLayoutItem* item = layout.itemAt(i);
+        QWidget* widget = item->widget();
+        if (widget != nullptr && (widget->focusPolicy() & Qt::TabFocus) != 0)
+            controls += widget;
+        else if (const QLayout* inner = widget != nullptr ? widget->layout() : item->layout())
+            CollectControls(*inner, controls);
+    }
+}
+
 } // namespace
+
+void OrderTabs(QWidget& page) {
+    QList<QWidget*> controls;
+    CollectControls(*page.layout(), controls);
+    for (qsizetype i = 1; i < controls.size(); ++i)
+        QWidget::setTabOrder(controls[i - 1], controls[i]);
+}
+
+void LeaveWheelToPage(QWidget& control) {
+    control.setFocusPolicy(Qt::StrongFocus);
+    control.installEventFilter(new WheelGuard(&control));
+}
+
+void LeaveWheelToPageBelow(QWidget& page) {
+    for (QWidget* widget : page.findChildren<QWidget*>())
+        if (qobject_cast<QComboBox*>(widget) != nullptr ||
+            qobject_cast<QAbstractSpinBox*>(widget) != nullptr || qobject_cast<QSlider*>(widget) != nullptr)
+            LeaveWheelToPage(*widget);
+}
 
 QVBoxLayout* MakeColumn(QWidget& owner, int spacing) {
     auto* column = new QVBoxLayout(&owner);

@@ -32,6 +32,15 @@ std::optional<T> ValueOf(const QComboBox& box) {
     return data.isValid() ? std::optional(data.value<T>()) : std::nullopt;
 }
 
+/// A control changes by the wheel only while it has the focus: over others the wheel moves the page.
+void LeaveWheelToPage(QWidget& control);
+/// Likewise for all that there is below `page`.
+void LeaveWheelToPageBelow(QWidget& page);
+
+/// Lets the Tab key go through the controls below `page` in the order of its layouts; those that came later
+/// are the last ones else.
+void OrderTabs(QWidget& page);
+
 /// A layout for `owner` that lies flush with what is around it.
 QVBoxLayout* MakeColumn(QWidget& owner, int spacing);
 

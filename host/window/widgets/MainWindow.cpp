@@ -2,6 +2,7 @@
 
 #include "host/window/model/Intake.h"
 #include "host/window/model/Words.h"
+#include "host/window/widgets/Closing.h"
 #include "host/window/widgets/EntryPage.h"
 #include "host/window/widgets/NamingDialog.h"
 #include "host/window/widgets/NoticeBar.h"
@@ -18,20 +19,19 @@
 #include <QMimeData>
 #include <QProgressBar>
 #include <QPushButton>
+#include <QSplitter>
 #include <QStackedWidget>
 #include <QVBoxLayout>
 
 #include <algorithm>
 #include <cmath>
 #include <stdexcept>
-#include <utility>
 
 namespace movieconv::window {
 namespace {
 
 const QString kUriList = QStringLiteral("text/uri-list");
 const QString kInterrupted = QStringLiteral("interrupted");
-const QString kClosing = QStringLiteral("closing");
 const QString kFull = QStringLiteral("full");
 
 std::vector<std::string> Bytes(const QStringList& paths) {
@@ -49,6 +49,12 @@ QList<quint64> Interrupted(const Queue& queue) {
     return ids;
 }
 
+/// The files stay where they are: after a move, who gave them would remove them.
+void AcceptAsCopy(QDropEvent& event) {
+    event.setDropAction(Qt::CopyAction);
+    event.accept();
+}
+
 } // namespace
 
 MainWindow::MainWindow(Queue& queue, Dispatcher& dispatcher, Runner& runner, Settings& settings)
@@ -57,6 +63,7 @@ MainWindow::MainWindow(Queue& queue, Dispatcher& dispatcher, Runner& runner, Set
       runner_(runner),
       settings_(settings),
       notices_(new NoticeBar),
+      closing_(new Closing(dispatcher, *notices_, this)),
       pages_(new QStackedWidget),
       view_(new QueueView(queue)),
       details_(new QStackedWidget),
@@ -87,6 +94,7 @@ MainWindow::MainWindow(Queue& queue, Dispatcher& dispatcher, Runner& runner, Set
     Connect();
     if (const QByteArray geometry = settings_.LoadGeometry(); !geometry.isEmpty())
         restoreGeometry(geometry);
+    splitter_->restoreState(settings_.LoadSplitter());
     ShowAll();
 }
 
@@ -98,10 +106,12 @@ void MainWindow::Connect() {
     connect(&queue_, &Queue::Complaint, this, &MainWindow::Tell);
     connect(&dispatcher_, &Dispatcher::Progressed, this, &MainWindow::ShowTotals);
     connect(&dispatcher_, &Dispatcher::Ended, this, &MainWindow::OnEnded);
-    connect(&dispatcher_, &Dispatcher::WorkEnded, this, [this] {
-        ShowAll();
-        if (closing_)
-            close();
+    connect(&dispatcher_, &Dispatcher::WorkEnded, this, &MainWindow::ShowAll);
+    connect(closing_, &Closing::Changed, this, &MainWindow::ShowTotals);
+    connect(closing_, &Closing::Ready, this, &MainWindow::close);
+    connect(closing_, &Closing::LeaveWanted, this, [this] {
+        KeepPlaces();
+        Q_EMIT LeaveWanted();
     });
     connect(&dispatcher_, &Dispatcher::PictureCame, workPage_, &WorkPage::ShowPicture);
     connect(workPage_, &WorkPage::PictureRoomChanged, &dispatcher_, &Dispatcher::SetPictureRoom);
@@ -195,7 +205,10 @@ void MainWindow::SavePreset(const Wishes& wishes) {
         dialog->setDirectory(folder);
     connect(dialog, &QFileDialog::fileSelected, this, [this, wishes](const QString& path) {
         try {
-            runner_.SavePreset(path.toStdString(), wishes);
+            const QStringList left = runner_.SavePreset(path.toStdString(), wishes);
+            if (!left.isEmpty())
+                Tell(tr("The preset is saved without what presets cannot hold: %1.")
+                         .arg(left.join(QStringLiteral(", "))));
             entryPage_->FillPresets();
             queue_.FillPresets();
             ShowEntry();
@@ -231,10 +244,18 @@ void MainWindow::LoadPreset(quint64 id) {
 }
 
 void MainWindow::StartOrGoOn() {
+    entryPage_->Commit();
     if (dispatcher_.IsPaused())
         dispatcher_.ResumeAll();
     else
         dispatcher_.Start();
+}
+
+/// On the disk at once: the program may be left without another chance.
+void MainWindow::KeepPlaces() {
+    settings_.SaveGeometry(saveGeometry());
+    settings_.SaveSplitter(splitter_->saveState());
+    settings_.Settle();
 }
 
 /// The page that the chosen movie's state asks for.
@@ -275,7 +296,7 @@ void MainWindow::ShowTotals() {
             parts += tr("%1 left for all").arg(LeftText(*totals.left));
         if (dispatcher_.StopsAfterThis())
             parts += tr("stops after this one");
-        if (closing_)
+        if (closing_->IsPending())
             parts += tr("closes when done");
     } else if (totals.waiting > 0) {
         parts += tr("%n movies are ready", "", totals.waiting);
@@ -367,40 +388,21 @@ void MainWindow::OnEnded(quint64 id) {
         view_->Select(next->id);
 }
 
-void MainWindow::AskBeforeClosing() {
-    const auto close = [this](bool wanted) {
-        closing_ = wanted;
-        ShowTotals();
-    };
-    notices_->Show(kClosing, tr("Movies are being converted. What is converted so far can be kept as it is."),
-                   {{tr("Stop and close"), [this] { StopAndClose(); }},
-                    {tr("Close when done"), [close] { close(true); }},
-                    {tr("Go on"), [close] { close(false); }}});
+void MainWindow::StopAndClose() {
+    closing_->StopAndClose();
 }
 
-void MainWindow::StopAndClose() {
-    closing_ = true;
-    ShowTotals();
-    notices_->Show(
-        kClosing, tr("Waiting until all is stopped. A disk or a network that does not answer holds this up."),
-        {{tr("Close at once"), [this] {
-              settings_.SaveGeometry(saveGeometry());
-              Q_EMIT LeaveWanted();
-          }}});
-    if (!std::exchange(stopping_, true))
-        dispatcher_.StopAll();
+bool MainWindow::IsStopping() const {
+    return closing_->IsStopping();
 }
 
 void MainWindow::closeEvent(QCloseEvent* event) {
-    if (dispatcher_.IsWorking()) {
+    entryPage_->Commit();
+    if (!closing_->MayClose()) {
         event->ignore();
-        if (stopping_ || notices_->Shows(kClosing)) // asked already: the second wish is an answer
-            StopAndClose();
-        else
-            AskBeforeClosing();
         return;
     }
-    settings_.SaveGeometry(saveGeometry());
+    KeepPlaces();
     event->accept();
     Q_EMIT Closed();
 }
@@ -413,7 +415,7 @@ void MainWindow::changeEvent(QEvent* event) {
 
 void MainWindow::dragEnterEvent(QDragEnterEvent* event) {
     if (event->mimeData()->hasFormat(kUriList))
-        event->acceptProposedAction();
+        AcceptAsCopy(*event);
 }
 
 void MainWindow::dropEvent(QDropEvent* event) {
@@ -421,7 +423,7 @@ void MainWindow::dropEvent(QDropEvent* event) {
     queue_.Add(PathsOfUriList(event->mimeData()->data(kUriList), others));
     for (const QString& other : others)
         Tell(tr("“%1” is not a file on this machine.").arg(other));
-    event->acceptProposedAction();
+    AcceptAsCopy(*event);
 }
 
 } // namespace movieconv::window

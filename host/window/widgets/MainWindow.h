@@ -18,6 +18,7 @@ class QStackedWidget;
 
 namespace movieconv::window {
 
+class Closing;
 class EntryPage;
 class NoticeBar;
 class OverPage;
@@ -34,6 +35,10 @@ public:
     void Tell(const QString& sentence);
     /// Offers what was interrupted once more.
     void OfferInterrupted();
+    /// Stops everything, then closes, without asking.
+    void StopAndClose();
+    /// Whether it closes as soon as everything is stopped.
+    bool IsStopping() const;
 
 Q_SIGNALS:
     /// The user wants the program to end, and nothing stands in the way.
@@ -66,6 +71,7 @@ private:
     void OpenFiles();
     void OpenFolder();
     void StartOrGoOn();
+    void KeepPlaces();
     void ShowNaming();
     void SavePreset(const Wishes& wishes);
     void LoadPreset(quint64 id);
@@ -75,15 +81,11 @@ private:
     void ShowAll();
     void OnChanged(quint64 id);
     void OnEnded(quint64 id);
-    void AskBeforeClosing();
-    void StopAndClose();
 
     Queue& queue_;
     Dispatcher& dispatcher_;
     Runner& runner_;
     Settings& settings_;
-    bool closing_ = false;
-    bool stopping_ = false; // in order to close
 
     QAction* start_ = nullptr;
     QAction* pause_ = nullptr;
@@ -98,8 +100,10 @@ private:
     QAction* folder_ = nullptr;
 
     NoticeBar* notices_;
+    Closing* closing_;
     QStackedWidget* pages_; // empty or the workspace
     QueueView* view_;
+    QSplitter* splitter_ = nullptr; // between these two
     QStackedWidget* details_;
     EntryPage* entryPage_;
     WorkPage* workPage_;

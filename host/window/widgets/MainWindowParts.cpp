@@ -82,17 +82,19 @@ void MainWindow::MakeQueueMenu() {
     menu->addSeparator();
     again_ = Add(menu, "again", tr("Convert &again"), tr("Ctrl+R"),
                  [this] { queue_.Retry(view_->SelectedIds()); });
-    const auto currentFile = [this] {
-        const Entry* entry = queue_.Find(view_->CurrentId());
-        return entry != nullptr && !entry->outcome.files.empty() ? entry->outcome.files.front()
-                                                                 : std::string();
+    // The current movie's, or of those selected the first one's that has any.
+    const auto chosenFile = [this] {
+        for (const quint64 id : QList<quint64>{view_->CurrentId()} + view_->SelectedIds())
+            if (const Entry* entry = queue_.Find(id); entry != nullptr && !entry->outcome.files.empty())
+                return entry->outcome.files.front();
+        return std::string();
     };
-    play_ = Add(menu, "play", tr("&Play the converted movie"), tr("Ctrl+Shift+P"), [this, currentFile] {
-        if (const std::string file = currentFile(); !file.empty())
+    play_ = Add(menu, "play", tr("&Play the converted movie"), tr("Ctrl+Shift+P"), [this, chosenFile] {
+        if (const std::string file = chosenFile(); !file.empty())
             Q_EMIT FileWanted(file);
     });
-    folder_ = Add(menu, "folder", tr("Show in &folder"), tr("Ctrl+Shift+F"), [this, currentFile] {
-        if (const std::string file = currentFile(); !file.empty())
+    folder_ = Add(menu, "folder", tr("Show in &folder"), tr("Ctrl+Shift+F"), [this, chosenFile] {
+        if (const std::string file = chosenFile(); !file.empty())
             Q_EMIT FolderWanted(file);
     });
     menu->addSeparator();
@@ -130,7 +132,7 @@ void MainWindow::MakeAtOnceMenu(QMenu* menu) {
         QAction* action = menu->addAction(tr("%n movies", "", count));
         action->setObjectName(QStringLiteral("atOnce%1").arg(count));
         action->setCheckable(true);
-        action->setChecked(count == dispatcher_.AtOnce());
+        action->setChecked(count == settings_.LoadAtOnce());
         group->addAction(action);
         connect(action, &QAction::triggered, this, [this, count] {
             dispatcher_.SetAtOnce(count);
@@ -208,17 +210,17 @@ QWidget* MainWindow::MakeEmptyPage() {
 QWidget* MainWindow::MakeWorkspace() {
     for (QWidget* page : std::initializer_list<QWidget*>{entryPage_, workPage_, overPage_})
         details_->addWidget(page);
-    auto* splitter = new QSplitter(Qt::Horizontal);
-    splitter->addWidget(view_);
-    splitter->addWidget(details_);
-    splitter->setStretchFactor(0, 0);
-    splitter->setStretchFactor(1, 1);
-    splitter->setSizes({kListWidth, 1080 - kListWidth});
-    splitter->setHandleWidth(1);
-    splitter->setChildrenCollapsible(false);
+    splitter_ = new QSplitter(Qt::Horizontal);
+    splitter_->addWidget(view_);
+    splitter_->addWidget(details_);
+    splitter_->setStretchFactor(0, 0);
+    splitter_->setStretchFactor(1, 1);
+    splitter_->setSizes({kListWidth, 1080 - kListWidth});
+    splitter_->setHandleWidth(1);
+    splitter_->setChildrenCollapsible(false);
     view_->setMinimumWidth(kLeastOfList);
     details_->setMinimumWidth(kLeastOfPage);
-    return splitter;
+    return splitter_;
 }
 
 QWidget* MainWindow::MakeFoot() {

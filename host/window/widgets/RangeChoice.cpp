@@ -39,8 +39,8 @@ RangeChoice::RangeChoice(Runner& runner, QWidget* parent)
     layout->addWidget(strip_);
     layout->addLayout(times);
     connect(strip_, &RangeStrip::RangeChosen, this, &RangeChoice::Chosen);
-    connect(begin_, &QLineEdit::editingFinished, this, &RangeChoice::ChooseTimes);
-    connect(end_, &QLineEdit::editingFinished, this, &RangeChoice::ChooseTimes);
+    connect(begin_, &QLineEdit::editingFinished, this, &RangeChoice::Commit);
+    connect(end_, &QLineEdit::editingFinished, this, &RangeChoice::Commit);
 }
 
 RangeChoice::~RangeChoice() = default;
@@ -76,7 +76,7 @@ void RangeChoice::ShowTimes() {
     end_->setText(wishes.end ? ExactClockText(*wishes.end) : length > 0 ? ClockText(length) : QString());
 }
 
-void RangeChoice::ChooseTimes() {
+void RangeChoice::Commit() {
     Wishes wishes = entry_.wishes;
     const bool known = entry_.facts && entry_.facts->lengthKnown;
     const double length = known ? entry_.facts->seconds : std::numeric_limits<double>::infinity();

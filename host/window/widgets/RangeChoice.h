@@ -23,6 +23,8 @@ public:
 
     /// Asks for the movie's pictures when it is another one, or was not known before.
     void Show(const Entry& entry);
+    /// Takes times that are typed and not yet told.
+    void Commit();
 
 Q_SIGNALS:
     void Chosen(double begin, std::optional<double> end);
@@ -30,7 +32,6 @@ Q_SIGNALS:
 private:
     QLineEdit* MakeTime(const QString& name);
     void ShowTimes();
-    void ChooseTimes();
     void AskForPictures();
 
     Runner& runner_;

@@ -117,6 +117,8 @@ void RangeStrip::paintEvent(QPaintEvent*) {
 }
 
 void RangeStrip::mousePressEvent(QMouseEvent* event) {
+    if (event->button() != Qt::LeftButton)
+        return QWidget::mousePressEvent(event);
     const double x = event->position().x();
     held_ = std::abs(x - XOf(begin_)) <= std::abs(x - XOf(end_.value_or(length_))) ? Handle::kBegin
                                                                                    : Handle::kEnd;

@@ -50,6 +50,7 @@ void SubtitleFiles::AddRow(size_t number) {
     label->setToolTip(ForToolTip(Shown(file.path)));
     auto* language = new QComboBox;
     AllowNarrow(*language);
+    LeaveWheelToPage(*language);
     language->setAccessibleName(tr("Language of %1").arg(name));
     language->addItem(tr("Language not told"), QString());
     for (const NamedLanguage& offered : OfferedLanguages())

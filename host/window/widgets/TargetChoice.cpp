@@ -36,9 +36,11 @@ TargetChoice::TargetChoice(QWidget* parent)
     layout->addWidget(warnings_);
     layout->addWidget(notes_);
     layout->addWidget(replace_);
-    connect(path_, &QLineEdit::editingFinished, this, [this] {
-        if (path_->isModified())
-            Q_EMIT PathChosen(shown_, path_->text().toStdString());
+    connect(path_, &QLineEdit::editingFinished, this, &TargetChoice::Commit);
+    // An empty field says that the rules hold, and so they have to.
+    connect(path_, &QLineEdit::textEdited, this, [this](const QString& text) {
+        if (text.isEmpty())
+            Q_EMIT PathChosen(shown_, {});
     });
     connect(browse_, &QPushButton::clicked, this, &TargetChoice::Browse);
     connect(replace_, &QCheckBox::clicked, this, [this](bool on) { Q_EMIT ReplaceChosen(shown_, on); });
@@ -52,12 +54,22 @@ void TargetChoice::Show(const Entry& entry) {
         path_->setText(target_);
         path_->setCursorPosition(static_cast<int>(target_.size()));
     }
-    warnings_->setText(entry.findings.warnings.join(QLatin1Char('\n')));
-    warnings_->setVisible(!entry.findings.warnings.isEmpty());
+    QStringList warnings = entry.findings.warnings;
+    if (entry.targetShared)
+        warnings.prepend(tr("Another movie in the queue goes there as well. Choose another name."));
+    warnings_->setText(warnings.join(QLatin1Char('\n')));
+    warnings_->setVisible(!warnings.isEmpty());
     notes_->setText(entry.findings.notes.join(QLatin1Char('\n')));
     notes_->setVisible(!entry.findings.notes.isEmpty());
     replace_->setChecked(entry.replace);
-    replace_->setVisible(entry.findings.targetExists);
+    replace_->setVisible(entry.findings.targetExists && (!entry.targetShared || entry.replace));
+}
+
+void TargetChoice::Commit() {
+    if (!path_->isModified())
+        return;
+    path_->setModified(false); // what holds is shown from now on
+    Q_EMIT PathChosen(shown_, path_->text().toStdString());
 }
 
 void TargetChoice::Browse() {

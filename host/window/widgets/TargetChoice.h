@@ -19,6 +19,8 @@ public:
     explicit TargetChoice(QWidget* parent = nullptr);
 
     void Show(const Entry& entry);
+    /// Takes what is typed and not yet told.
+    void Commit();
     /// What is always shown of it, beside the path.
     QPushButton* Button() const { return browse_; }
 
