@@ -158,13 +158,12 @@ std::optional<Plan> Foreman::Prepare() {
         if (order_.only && (*order_.only < 0 || *order_.only >= plan.Pieces()))
             throw Failure(Category::kRequest, fmt::format("the plan has the pieces 0 to {}, no piece {}",
                                                           plan.Pieces() - 1, *order_.only));
+        if (order_.only)
+            RequirePlaces(order_.planPath, WholeRequest(plan), order_.only);
         return plan;
     }
     CheckOutput(*order_.request);
-    if (IsPieceOf(order_.planPath, order_.request->input))
-        throw Failure(Category::kRequest, fmt::format("\"{}\" has the name of a piece that is to be made; "
-                                                      "give the output another name",
-                                                      order_.request->input));
+    RequirePlaces(order_.planPath, *order_.request, std::nullopt);
     Plan begun = BeginPlan(*order_.request, order_.division);
     if (std::optional<Plan> before = Leftover(begun))
         return before;
@@ -191,7 +190,7 @@ std::optional<Plan> Foreman::Leftover(const Plan& now) {
     if (!order_.resume && (planned || pieces > 0))
         leftover_ = fmt::format("\"{}\" with {} pieces is left of an earlier run; it is made anew",
                                 order_.planPath, pieces);
-    RemovePieces(order_.planPath);
+    RemovePieces(order_.planPath, *order_.request);
     return std::nullopt;
 }
 
@@ -336,7 +335,7 @@ void Foreman::JoinAll() {
         joined.failure.reset();
     }
     if (joined.outcome == Outcome::kDone && !order_.keepPieces) {
-        RemovePieces(order_.planPath);
+        RemovePieces(order_.planPath, WholeRequest(plan_));
         if (order_.request) // it was of our own making
             unlink(order_.planPath.c_str());
     }

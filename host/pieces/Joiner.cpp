@@ -42,9 +42,7 @@ void CheckPieces(const Plan& plan, const std::string& planPath, const std::funct
 }
 
 Request JoinRequest(const Plan& plan, bool replace) {
-    Request request = plan.settings;
-    request.input = plan.source.path;
-    request.output = plan.output;
+    Request request = WholeRequest(plan);
     request.overwrite = replace;
     request.keepPartial = false; // it can be joined again
     request.bitExact = true;     // the multiplexers' numbers of their own are drawn by lot

@@ -288,9 +288,15 @@ std::string TellBitRate(const Plan& plan) {
         plan.pictures.size(), seconds);
 }
 
-Request RequestFor(const Plan& plan, int number, const std::string& output) {
+Request WholeRequest(const Plan& plan) {
     Request request = plan.settings;
     request.input = plan.source.path;
+    request.output = plan.output;
+    return request;
+}
+
+Request RequestFor(const Plan& plan, int number, const std::string& output) {
+    Request request = WholeRequest(plan);
     request.output = output;
     request.overwrite = true; // whatever was left there
     request.keepPartial = false;

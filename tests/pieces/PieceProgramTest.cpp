@@ -245,7 +245,7 @@ TEST(Pieces, LeaveTheirSourceWhateverItIsCalled) {
     } cases[] = {{".part", {"--jobs", "1", "--resume"}, 0},
                  {".plan", {"--jobs", "1", "-y"}, kCannotWrite},
                  {".plan.0000.piece", {"--jobs", "1", "-y"}, kUsage},
-                 {".plan.making-desk-7", {"--jobs", "1", "-y"}, kUsage},
+                 {".plan.making-desk-7", {"--jobs", "1", "-y"}, 0},
                  {".clips", {"--split", "4", "-y"}, kCannotWrite}};
     for (const auto& test : cases) {
         const std::string source = output + test.name;
@@ -257,6 +257,48 @@ TEST(Pieces, LeaveTheirSourceWhateverItIsCalled) {
         std::filesystem::remove(output);
     }
     EXPECT_TRUE(folder.Names().empty());
+}
+
+/// What else stands there under names that conversions in pieces use, or nearly so. Only what they made is
+/// theirs.
+TEST(Pieces, RemoveNothingButWhatTheyMade) {
+    const Planned farm;
+    farm.MakeAll();
+    const std::string output = farm.folder / "out.mp4";
+    const std::string cue = "1\n00:00:01,000 --> 00:00:03,000\nA cue\n";
+    const struct {
+        const char* name;
+        std::string content;
+        int code;
+        bool stays;
+    } cases[] = {{".0000.piece", cue, kUsage, true}, // which is read
+                 {".0001.piece", cue, kCannotWrite, true},
+                 {".0001.piece", ReadFile(farm.Piece(1)).substr(0, 5000), 0, false},
+                 {".0001.piece", "", 0, false},
+                 {".0001.piece.mine", ReadFile(farm.Piece(1)), 0, true},
+                 {".00001.piece", ReadFile(farm.Piece(1)), 0, true},
+                 {".0001.piece.making-desk-7.part2", ReadFile(farm.Piece(1)), 0, false},
+                 {".0001.piece.making-desk-7", "MCP", 0, false},
+                 {".0001.piece.making-of-2024-1", ReadFile(Source()), 0, true},
+                 {".0001.piece.making-desk-7.part.mine", ReadFile(farm.Piece(1)), 0, true},
+                 {".making-of-2024-1", ReadFile(Source()), 0, true},
+                 {".making-desk-7", ReadFile(farm.plan).substr(0, 100), 0, false}};
+    for (const auto& test : cases) {
+        const std::string file = output + ".plan" + test.name;
+        WriteFile(file, test.content);
+        Args options{"-q", "--jobs", "1", Source(), output};
+        if (test.code == kUsage)
+            options.insert(options.end(), {"--subtitle-file", file});
+        const Result result = Call(options);
+        EXPECT_EQ(result.code, test.code) << test.name << result.err;
+        EXPECT_EQ(std::filesystem::exists(file), test.stays) << test.name;
+        EXPECT_TRUE(ReadFile(file) == (test.stays ? test.content : "")) << test.name;
+        std::filesystem::remove(file);
+        std::filesystem::remove(output);
+    }
+    WriteFile(farm.Piece(1), "precious");
+    EXPECT_EQ(farm.Make(1).code, kCannotWrite);
+    EXPECT_EQ(ReadFile(farm.Piece(1)), "precious");
 }
 
 // Values that are nested very deep take the stack of whoever copies or prints them.
