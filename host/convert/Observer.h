@@ -70,7 +70,7 @@ struct Warning {
         kWaitsForRoom, ///< The disk is full; the conversion goes on when there is room, or ends by Stop.
         kChosen,       ///< What was chosen for Request::maxSize or Request::detectCrop.
         kFailed,       ///< One of many movies failed; the others go on.
-        kLeftover,     ///< Something of an earlier run is there and not used.
+        kLeftover,     ///< Something of a run that broke off stays, for another one to go on with.
         kSource,       ///< Something was wrong with the source and has been put right or skipped.
     };
     Kind kind;

@@ -161,8 +161,8 @@ void Crew::FollowWishes() {
     TickClock();
 }
 
-void Crew::TickClock() {
-    if (paused_)
+void Crew::TickClock(bool stands) {
+    if (paused_ || stands)
         clock_.Stand(WorkClock::Now());
     else
         clock_.Go(WorkClock::Now());

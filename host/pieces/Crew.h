@@ -82,7 +82,9 @@ protected:
     bool Stopped() const { return stop_; }
     Outlet& News() { return outlet_; }
     double Worked() const { return clock_.Seconds(); }
-    void TickClock();
+    /// Unless there is a pause or what is done stands still.
+    void TickClock(bool stands = false);
+    Bell& Ringer() { return bell_; } ///< Wakes the crew's thread, as Stop does.
 
     /// What the conversions under way have come to together; `length` is that of what they have to do.
     Progress UnderWay() const;

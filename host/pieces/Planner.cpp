@@ -278,7 +278,7 @@ std::optional<Plan> MakePlan(Plan plan, const std::function<bool()>& stopped) {
 }
 
 std::string TellBitRate(const Plan& plan) {
-    if (!plan.hasRates)
+    if (!plan.hasRates || plan.pictures.size() == 1)
         return {};
     const double seconds = ToSeconds(plan.pictures.back().end - plan.pictures.front().begin) /
                            static_cast<double>(plan.pictures.size());
