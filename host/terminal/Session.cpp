@@ -90,7 +90,7 @@ void Session::Started(const Start& news) {
     Arm();
     reporter_->Started(news); // whoever reads this may send signals
     for (const std::string& complaint : options_.complaints)
-        reporter_->Warn(complaint);
+        reporter_->Warn(complaint, {});
 }
 
 void Session::Arm() {
@@ -104,7 +104,8 @@ void Session::Progressed(const Progress& news) {
 }
 
 void Session::Opened(const OpenedFile& news) {
-    control_.NoteFile(news.temporaryPath);
+    if (news.input.empty()) // of many, several are open
+        control_.NoteFile(news.temporaryPath);
     reporter_->Opened(news);
 }
 
@@ -131,7 +132,7 @@ void Session::Ended(const Verdict& news) {
         throw Failure(*news.failure);
     if (preview_) {
         if (const std::string failure = preview_->Finish(); !failure.empty())
-            reporter_->Warn(failure);
+            reporter_->Warn(failure, {});
     }
     reporter_->Ended(news);
     code_ = CodeOf(news);
