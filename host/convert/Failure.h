@@ -26,6 +26,7 @@ enum class Reason {
     kCodec,         ///< The file format or the codec cannot be written.
     kBeginTooLate,  ///< The begin is not before the source's end.
     kPlaylist,      ///< The source is a playlist, and the request does not allow that.
+    kLeftover,      ///< What an earlier run left would be lost, and the request does not allow that.
     kCannotResume,  ///< What is left of an earlier run is of another conversion.
     kUnknownLength, ///< The source tells no length, and the request neither.
 };

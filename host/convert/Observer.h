@@ -52,7 +52,8 @@ struct OpenedFile {
     int number; ///< From 1.
     std::string path;
     std::string temporaryPath; ///< Where the data is until the file is complete.
-    int64_t begin = 0; ///< Stamp of its first picture in the source where it is a clip, in media time.
+    int64_t begin = 0;      ///< Stamp of its first picture in the source where it is a clip, in media time.
+    std::string input = {}; ///< Of which of many movies; empty where there is but one.
 };
 
 struct ClosedFile {
@@ -61,7 +62,8 @@ struct ClosedFile {
     double videoSeconds; ///< In the file; 0 without such a stream.
     double audioSeconds;
     int64_t bytes;
-    int64_t pictures; ///< Taken from the source.
+    int64_t pictures;       ///< Taken from the source.
+    std::string input = {}; ///< As of OpenedFile.
 };
 
 struct Warning {
@@ -70,11 +72,12 @@ struct Warning {
         kWaitsForRoom, ///< The disk is full; the conversion goes on when there is room, or ends by Stop.
         kChosen,       ///< What was chosen for Request::maxSize or Request::detectCrop.
         kFailed,       ///< One of many movies failed; the others go on.
-        kLeftover,     ///< Something of an earlier run is there and not used.
+        kLeftover,     ///< Something of a run that broke off stays, for another one to go on with.
         kSource,       ///< Something was wrong with the source and has been put right or skipped.
     };
     Kind kind;
-    std::string text; ///< A sentence without a full stop.
+    std::string text;       ///< A sentence without a full stop.
+    std::string input = {}; ///< As of OpenedFile.
 };
 
 /// Something of the source that its output does not hold, although the conversion goes well.
@@ -86,6 +89,7 @@ struct NotCarried {
     std::string codec;         ///< Of an attached file of no codec its name. Empty when it is not known.
     std::string language;      ///< Empty when it is not known.
     std::string reason;        ///< A clause.
+    std::string input = {};    ///< As of OpenedFile.
 };
 
 /// A picture for display: blue, green, red and 255 for each pixel, without gaps, top row first.

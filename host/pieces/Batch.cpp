@@ -3,6 +3,8 @@
 #include "host/convert/EncodePlan.h"
 #include "host/convert/Failure.h"
 #include "host/convert/Sources.h"
+#include "host/pieces/FileLock.h"
+#include "host/pieces/MovieErrand.h"
 #include "host/pieces/SettingsText.h"
 
 #include <algorithm>
@@ -12,6 +14,7 @@
 #include <memory>
 #include <sys/stat.h>
 #include <thread>
+#include <unistd.h>
 #include <utility>
 
 namespace movieconv {
@@ -85,34 +88,29 @@ std::string SettingsOf(Request request) {
     return settings.dump();
 }
 
-/// One movie being converted.
-class MovieErrand final : public Errand {
-public:
-    MovieErrand(Outlet& news, BatchJournal& journal, std::string output, SourceMark source,
-                const std::string& settings)
-        : news_(news),
-          journal_(journal),
-          output_(std::move(output)),
-          source_(std::move(source)),
-          settings_(settings) {}
-
-    void Opened(const OpenedFile& news) override {
-        journal_.NoteBegun(output_, source_, settings_, news.temporaryPath);
+/// Why a file that was found in a folder is none; empty when it is one.
+std::string WhyNoMovie(Request request) {
+    request.detectCrop = false; // which takes long and does not matter here
+    try {
+        LookAtSource(request);
+        return {};
+    } catch (const Failure& failure) {
+        return failure.Text();
     }
-    void Closed(const ClosedFile& news) override { news_.Closed(news); }
-    void LeftBehind(const NotCarried& news) override { news_.LeftBehind(news); }
-    void Conclude(Verdict& verdict) override {
-        if (verdict.outcome == Outcome::kDone)
-            journal_.NoteDone(output_, source_, settings_);
-    }
+}
 
-private:
-    Outlet& news_;
-    BatchJournal& journal_;
-    const std::string output_;
-    const SourceMark source_;
-    const std::string& settings_;
-};
+bool IsPlaylist(Request request) {
+    if (!request.playlists)
+        return false;
+    request.playlists = false;
+    request.detectCrop = false;
+    try {
+        LookAtSource(request);
+        return false;
+    } catch (const Failure& failure) {
+        return failure.Why() == Reason::kPlaylist;
+    }
+}
 
 } // namespace
 
@@ -163,19 +161,47 @@ void Batch::List() {
     }
     for (const Movie& movie : movies)
         NoteSource(movie.input);
-    std::map<std::string, std::string> taken;
+    RequireOwnOutputs(movies);
+    waiting_.assign(movies.begin(), movies.end());
+}
+
+/// Throws Failure when two would become the same file. What is no movie, and only stands in the same folder,
+/// takes no name from one.
+void Batch::RequireOwnOutputs(const std::vector<Movie>& movies) {
+    std::map<std::string, std::vector<const Movie*>> takers;
     for (const Movie& movie : movies)
-        if (const auto [first, isNew] = taken.emplace(TargetOf(movie.output), movie.input); !isNew)
+        takers[TargetOf(movie.output)].push_back(&movie);
+    for (auto& [target, those] : takers) {
+        if (those.size() == 1)
+            continue;
+        those.erase(std::remove_if(those.begin(), those.end(),
+                                   [this](const Movie* movie) {
+                                       return !movie->named && !WhyNoMovie(RequestFor(*movie)).empty();
+                                   }),
+                    those.end());
+        if (those.size() > 1)
             throw Failure(Category::kRequest,
                           fmt::format("\"{}\" and \"{}\" would both become \"{}\"; choose other names",
-                                      first->second, movie.input, first->first));
-    waiting_.assign(movies.begin(), movies.end());
+                                      those[0]->input, those[1]->input, target));
+    }
+}
+
+Request Batch::RequestFor(const Movie& movie) const {
+    Request request = order_.request;
+    request.input = movie.input;
+    request.output = movie.output;
+    return request;
 }
 
 void Batch::NoteSource(const std::string& path) {
     struct stat status {};
     if (stat(path.c_str(), &status) == 0)
         sources_.emplace(status.st_dev, status.st_ino);
+}
+
+bool Batch::IsSource(const std::string& path) const {
+    struct stat status {};
+    return stat(path.c_str(), &status) == 0 && sources_.count({status.st_dev, status.st_ino}) > 0;
 }
 
 std::string Batch::OutputFor(const std::string& input, const std::string& extension) const {
@@ -200,42 +226,52 @@ std::optional<Crew::Assignment> Batch::Next() {
 
 /// Nothing when it is converted already, or no movie.
 std::optional<Crew::Assignment> Batch::Assign(const Movie& movie) {
-    Request request = order_.request;
-    request.input = movie.input;
-    request.output = movie.output;
-    struct stat target {};
-    if (stat(movie.output.c_str(), &target) == 0 && sources_.count({target.st_dev, target.st_ino}) > 0)
+    Request request = RequestFor(movie);
+    if (IsSource(movie.output))
         throw Failure(
             Category::kRequest,
             fmt::format("its output \"{}\" is one of the sources; choose other names", movie.output));
     SourceMark source = MarkOf(movie.input);
-    if (!movie.named && !IsMovie(request)) {
-        ++skipped_;
-        return std::nullopt;
-    }
     const BatchJournal::State state = journal_->StateOf(movie.output, source, settings_);
-    if (state == BatchJournal::State::kDone) {
+    if ((!movie.named && !IsMovie(request)) || IsDone(request, state)) {
         ++skipped_;
-        News().Warned({Warning::Kind::kChosen,
-                       fmt::format("\"{}\" is there already, from the same source", movie.output)});
         return std::nullopt;
     }
-    request.overwrite = request.overwrite || state == BatchJournal::State::kBegun;
-    return Assignment{request, std::make_unique<MovieErrand>(News(), *journal_, movie.output,
+    RemoveUnfinished(movie.output);
+    request.overwrite = request.overwrite || state != BatchJournal::State::kUnknown;
+    return Assignment{request, std::make_unique<MovieErrand>(News(), *journal_, opened_, request,
                                                              std::move(source), settings_)};
 }
 
-/// Of a file that was found in a folder; tells why not.
-bool Batch::IsMovie(Request request) {
-    request.detectCrop = false; // which takes long and does not matter here
-    try {
-        LookAtSource(request);
-        return true;
-    } catch (const Failure& failure) {
-        News().Warned(
-            {Warning::Kind::kSource, fmt::format("\"{}\" is left out: {}", request.input, failure.Text())});
+/// Whether nothing is left to do; tells it. Of a playlist the source's mark does not tell whether what it
+/// names is still the same.
+bool Batch::IsDone(const Request& request, BatchJournal::State state) {
+    if (state != BatchJournal::State::kDone)
         return false;
-    }
+    const bool isPlaylist = IsPlaylist(request);
+    News().Warned({Warning::Kind::kChosen,
+                   isPlaylist ? fmt::format("\"{}\" is made anew: it was made of a playlist, and what that "
+                                            "names may have changed",
+                                            request.output)
+                              : fmt::format("\"{}\" is there already, from the same source", request.output),
+                   request.input});
+    return !isPlaylist;
+}
+
+/// What a run left that was killed; one that still runs holds its file.
+void Batch::RemoveUnfinished(const std::string& output) const {
+    const std::optional<std::string> left = journal_->Unfinished(output);
+    if (left && !IsSource(*left) && FileLock(*left).Result() == FileLock::State::kHeld)
+        unlink(left->c_str());
+}
+
+/// Of a file that was found in a folder; tells why not.
+bool Batch::IsMovie(const Request& request) {
+    const std::string why = WhyNoMovie(request);
+    if (!why.empty())
+        News().Warned({Warning::Kind::kSource, fmt::format("\"{}\" is left out: {}", request.input, why),
+                       request.input});
+    return why.empty();
 }
 
 void Batch::Take(const std::string& input, const Verdict& ending) {
@@ -249,7 +285,7 @@ void Batch::Take(const std::string& input, const Verdict& ending) {
 
 void Batch::Fail(const std::string& input, const Failure& failure) {
     ++failed_;
-    News().Warned({Warning::Kind::kFailed, fmt::format("\"{}\": {}", input, failure.Text())});
+    News().Warned({Warning::Kind::kFailed, fmt::format("\"{}\": {}", input, failure.Text()), input});
     if (!worst_ || Badness(failure.Kind()) > Badness(worst_->Kind()))
         worst_ = failure;
 }

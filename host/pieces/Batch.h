@@ -5,6 +5,7 @@
 #include "host/pieces/BatchJournal.h"
 #include "host/pieces/Crew.h"
 
+#include <atomic>
 #include <deque>
 #include <optional>
 #include <set>
@@ -46,16 +47,22 @@ private:
     void Report() override;
 
     void List();
+    void RequireOwnOutputs(const std::vector<Movie>& movies);
     void NoteSource(const std::string& path);
+    bool IsSource(const std::string& path) const;
+    void RemoveUnfinished(const std::string& output) const;
     std::string OutputFor(const std::string& input, const std::string& extension) const;
     std::optional<Assignment> Assign(const Movie& movie);
-    bool IsMovie(Request request);
+    bool IsDone(const Request& request, BatchJournal::State state);
+    bool IsMovie(const Request& request);
+    Request RequestFor(const Movie& movie) const;
     void Fail(const std::string& input, const Failure& failure);
     Verdict Conclude();
 
     const BatchOrder order_;
     std::optional<BatchJournal> journal_;
     std::string settings_;
+    std::atomic<int> opened_{0}; // files
 
     // The batch's own thread's.
     std::deque<Movie> waiting_;

@@ -56,9 +56,10 @@ void BatchJournal::Read(const std::string& text) {
 bool BatchJournal::Enter(const std::optional<Json>& line) {
     try {
         if (line)
-            entries_[NameFromJson(line->at("output"))] = {line->at("state").get<std::string>() == "done",
-                                                          line->at("task").get<std::string>(),
-                                                          line->at("result").get<std::string>()};
+            entries_[NameFromJson(line->at("output"))] = {
+                line->at("state").get<std::string>() == "done", line->at("task").get<std::string>(),
+                line->at("result").get<std::string>(),
+                line->contains("temporary") ? NameFromJson(line->at("temporary")) : ""};
         return line.has_value();
     } catch (const Json::exception&) {
         return false;
@@ -79,9 +80,20 @@ BatchJournal::State BatchJournal::StateOf(const std::string& output, const Sourc
     return stands ? State::kDone : State::kUnknown;
 }
 
+/// What stands there under that name can be somebody else's by now.
+std::optional<std::string> BatchJournal::Unfinished(const std::string& output) const {
+    const std::lock_guard lock(mutex_);
+    const auto found = entries_.find(text::NameOf(output));
+    if (found == entries_.end() || found->second.temporary.empty())
+        return std::nullopt;
+    std::string left = text::FolderOf(path_) + "/" + text::NameOf(found->second.temporary);
+    const std::string birth = BirthOf(left);
+    return !birth.empty() && birth == found->second.result ? std::optional(std::move(left)) : std::nullopt;
+}
+
 void BatchJournal::NoteBegun(const std::string& output, const SourceMark& source, const std::string& settings,
                              const std::string& temporary) {
-    Note(output, {false, TaskOf(source, settings), BirthOf(temporary, output)});
+    Note(output, {false, TaskOf(source, settings), BirthOf(temporary, output), text::NameOf(temporary)});
 }
 
 void BatchJournal::NoteDone(const std::string& output, const SourceMark& source,
@@ -91,10 +103,13 @@ void BatchJournal::NoteDone(const std::string& output, const SourceMark& source,
 
 void BatchJournal::Note(const std::string& output, const Entry& entry) {
     const std::string name = text::NameOf(output);
-    const std::string line = CheckedLine({{"state", entry.done ? "done" : "begun"},
-                                          {"output", NameAsJson(name)},
-                                          {"task", entry.task},
-                                          {"result", entry.result}});
+    Json object{{"state", entry.done ? "done" : "begun"},
+                {"output", NameAsJson(name)},
+                {"task", entry.task},
+                {"result", entry.result}};
+    if (!entry.done)
+        object["temporary"] = NameAsJson(entry.temporary);
+    const std::string line = CheckedLine(object);
     const std::lock_guard lock(mutex_);
     // A line that was cut by a crash ends here; behind a whole one it is empty.
     AppendWhole(path_, (entries_.empty() && damaged_ == 0 ? "" : "\n") + line);

@@ -37,13 +37,17 @@ public:
     /// complete: what stands under its own name later may be somebody else's.
     void NoteBegun(const std::string& output, const SourceMark& source, const std::string& settings,
                    const std::string& temporary);
+    /// What a run that broke off left of the output, under a temporary name; nothing when there is none.
+    std::optional<std::string> Unfinished(const std::string& output) const;
+
     void NoteDone(const std::string& output, const SourceMark& source, const std::string& settings);
 
 private:
     struct Entry {
         bool done = false;
-        std::string task;   ///< Hash of source and settings.
-        std::string result; ///< Hash of the output's mark when it is done, before that its BirthOf.
+        std::string task;           ///< Hash of source and settings.
+        std::string result;         ///< Hash of the output's mark when it is done, before that its BirthOf.
+        std::string temporary = {}; ///< The name of what is not done.
     };
 
     void Read(const std::string& text);

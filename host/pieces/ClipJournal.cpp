@@ -1,6 +1,7 @@
 #include "host/pieces/ClipJournal.h"
 
 #include "host/convert/Failure.h"
+#include "host/convert/OutputCheck.h"
 #include "host/pieces/CheckedLine.h"
 #include "host/pieces/FileBirth.h"
 #include "host/pieces/WholeFile.h"
@@ -11,6 +12,7 @@
 #include <fmt/format.h>
 #include <sstream>
 #include <stdexcept>
+#include <string_view>
 #include <unistd.h>
 #include <vector>
 
@@ -19,6 +21,7 @@ namespace {
 
 constexpr int kClipListVersion = 1;
 constexpr int64_t kLargestClipList = 256 << 20;
+constexpr std::string_view kClipListHead = "{\"version\":"; // with which Header begins
 
 /// By which a finished clip is known again, wherever its folder is now.
 Json MarkOfClip(const std::string& path) {
@@ -162,7 +165,8 @@ void ClipJournal::Remove() const {
     unlink(path_.c_str());
     std::error_code ignored;
     for (const std::filesystem::path& left : FilesThatBegin(path_))
-        if (IsInTheMaking(left, path_) && !std::filesystem::equivalent(left, request_.input, ignored))
+        if (IsInTheMaking(left, path_) && BeginsLike(left, kClipListHead) &&
+            WhatIsReadFrom(left.string(), request_) == nullptr)
             std::filesystem::remove(left, ignored);
 }
 

@@ -41,7 +41,7 @@ void ClipRun::Prepare() {
         throw Failure(
             failure.Kind(),
             fmt::format("{}, of an earlier run of which \"{}\" tells", failure.Text(), journal_.Path()),
-            failure.Why());
+            Reason::kLeftover);
     }
 }
 
@@ -85,8 +85,8 @@ void ClipRun::Started(const struct Start& news) {
             {Warning::Kind::kChosen, fmt::format("{} clips are made already", request_.firstClip->number)});
     if (isLeft_)
         outlet_.Warned(
-            {Warning::Kind::kLeftover,
-             fmt::format("\"{}\" is left of an earlier run; its clips are made anew", journal_.Path())});
+            {Warning::Kind::kChosen,
+             fmt::format("\"{}\" was left of an earlier run; its clips are made anew", journal_.Path())});
 }
 
 /// When a clip is opened, the one before it is finished and under its name.

@@ -37,7 +37,9 @@ public:
     }
     void Opened(const OpenedFile& news) override { errand_->Opened(news); }
     void Closed(const ClosedFile& news) override { errand_->Closed(news); }
-    void Warned(const Warning& news) override { crew_.outlet_.Warned(news); }
+    void Warned(const Warning& news) override {
+        crew_.outlet_.Warned({news.kind, news.text, errand_->Movie()});
+    }
     void LeftBehind(const NotCarried& news) override { errand_->LeftBehind(news); }
     void Ended(const Verdict& news) override {
         concluding_ = &news;
@@ -161,8 +163,8 @@ void Crew::FollowWishes() {
     TickClock();
 }
 
-void Crew::TickClock() {
-    if (paused_)
+void Crew::TickClock(bool stands) {
+    if (paused_ || stands)
         clock_.Stand(WorkClock::Now());
     else
         clock_.Go(WorkClock::Now());

@@ -27,6 +27,9 @@ public:
     /// is how it ends then.
     virtual void Conclude(Verdict& verdict) = 0;
 
+    /// Whose news it is where there are several movies; otherwise empty.
+    virtual std::string Movie() const { return {}; }
+
     /// How much of the whole work `latest` stands for, in seconds.
     virtual double Share(const Progress& latest) const { return latest.position; }
 
@@ -82,7 +85,9 @@ protected:
     bool Stopped() const { return stop_; }
     Outlet& News() { return outlet_; }
     double Worked() const { return clock_.Seconds(); }
-    void TickClock();
+    /// Unless there is a pause or what is done stands still.
+    void TickClock(bool stands = false);
+    Bell& Ringer() { return bell_; } ///< Wakes the crew's thread, as Stop does.
 
     /// What the conversions under way have come to together; `length` is that of what they have to do.
     Progress UnderWay() const;

@@ -3,13 +3,13 @@
 #include "host/convert/Amounts.h"
 #include "host/convert/Failure.h"
 #include "host/convert/OutputCheck.h"
-#include "host/pieces/Joiner.h"
 #include "host/pieces/PieceFile.h"
 #include "host/pieces/WholeFile.h"
 #include "host/source/MediaTime.h"
 #include "text/FileNames.h"
 
 #include <algorithm>
+#include <chrono>
 #include <filesystem>
 #include <fmt/format.h>
 #include <fstream>
@@ -42,18 +42,6 @@ Request RequestOf(const PieceOrder& order, const Plan& plan, int number, const s
     request.onFull = order.onFull;
     request.niceness = order.niceness;
     return request;
-}
-
-/// Throws Failure when a file is something else, which must not be lost.
-void RequirePlan(const std::string& path) {
-    try {
-        ReadPlan(path);
-    } catch (const Failure& failure) {
-        throw Failure(Category::kOutput,
-                      fmt::format("the plan would replace another file: {}; give the output another name, or "
-                                  "remove that file",
-                                  failure.Text()));
-    }
 }
 
 } // namespace
@@ -146,25 +134,31 @@ Verdict Foreman::Perform() {
     verdict_.earlier = earlier_;
     verdict_.worked = Worked();
     verdict_.bytes = bytes_;
+    if (order_.join) { // a piece is no file that was asked for
+        verdict_.files = 0;
+        verdict_.bytes = 0;
+    }
     if (verdict_.outcome == Outcome::kDone && order_.join)
         JoinAll();
+    if (verdict_.outcome != Outcome::kDone && order_.request)
+        TellWhatStays();
     return verdict_;
+}
+
+void Foreman::TellWhatStays() {
+    if (const int pieces = CountPieces(order_.planPath); pieces > 0)
+        News().Warned(
+            {Warning::Kind::kLeftover, fmt::format("{} of {} pieces are made and stay beside \"{}\"", pieces,
+                                                   plan_.Pieces(), order_.planPath)});
 }
 
 /// The plan, made and written where that was asked for; nothing when it was stopped.
 std::optional<Plan> Foreman::Prepare() {
-    if (!order_.request) {
-        Plan plan = ReadPlan(order_.planPath);
-        if (order_.only && (*order_.only < 0 || *order_.only >= plan.Pieces()))
-            throw Failure(Category::kRequest, fmt::format("the plan has the pieces 0 to {}, no piece {}",
-                                                          plan.Pieces() - 1, *order_.only));
-        return plan;
-    }
+    if (!order_.request)
+        return ReadGivenPlan();
     CheckOutput(*order_.request);
-    if (IsPieceOf(order_.planPath, order_.request->input))
-        throw Failure(Category::kRequest, fmt::format("\"{}\" has the name of a piece that is to be made; "
-                                                      "give the output another name",
-                                                      order_.request->input));
+    CheckPlaces();
+    lock_.emplace(order_.planPath);
     Plan begun = BeginPlan(*order_.request, order_.division);
     if (std::optional<Plan> before = Leftover(begun))
         return before;
@@ -174,9 +168,36 @@ std::optional<Plan> Foreman::Prepare() {
     return plan;
 }
 
-/// The plan of an earlier run that is to be gone on with. Otherwise what is left of one is told, and removed.
+Plan Foreman::ReadGivenPlan() const {
+    Plan plan = ReadPlan(order_.planPath);
+    if (order_.only && (*order_.only < 0 || *order_.only >= plan.Pieces()))
+        throw Failure(Category::kRequest, fmt::format("the plan has the pieces 0 to {}, no piece {}",
+                                                      plan.Pieces() - 1, *order_.only));
+    if (order_.only)
+        RequirePlaces(order_.planPath, WholeRequest(plan), order_.only);
+    return plan;
+}
+
+/// Refuses, before the source is read, names that pieces cannot have.
+void Foreman::CheckPlaces() const {
+    const std::string& output = order_.request->output;
+    const std::string longest =
+        NameInTheMaking(PiecePath(order_.planPath, kMostPieces)) + text::PartialSuffix(1);
+    try {
+        CheckName(longest);
+    } catch (const Failure& failure) {
+        throw Failure(failure.Kind(),
+                      fmt::format("the name \"{}\" is too long for a conversion in pieces, whose "
+                                  "files have longer ones; choose a shorter one",
+                                  output));
+    }
+    RequirePlaces(order_.planPath, *order_.request, std::nullopt);
+}
+
+/// The plan of an earlier run that is to be gone on with. Otherwise what is left of one is removed.
 std::optional<Plan> Foreman::Leftover(const Plan& now) {
-    const bool planned = std::filesystem::exists(order_.planPath);
+    std::error_code unknown;
+    const bool planned = std::filesystem::exists(order_.planPath, unknown);
     const int pieces = CountPieces(order_.planPath);
     if (planned && order_.resume) {
         Plan before = ReadPlan(order_.planPath);
@@ -186,13 +207,33 @@ std::optional<Plan> Foreman::Leftover(const Plan& now) {
                           Reason::kCannotResume);
         return before;
     }
-    if (planned) // nobody has named it, so leave to replace the output is none to replace this
-        RequirePlan(order_.planPath);
+    if (planned)
+        RequireLeave(now, pieces);
     if (!order_.resume && (planned || pieces > 0))
-        leftover_ = fmt::format("\"{}\" with {} pieces is left of an earlier run; it is made anew",
+        leftover_ = fmt::format("\"{}\" with {} pieces was left of an earlier run; it is made anew",
                                 order_.planPath, pieces);
-    RemovePieces(order_.planPath);
+    RemovePieces(order_.planPath, *order_.request);
     return std::nullopt;
+}
+
+/// Throws Failure when the plan that is there is something else, which must not be lost, or pieces of this
+/// very conversion would be. Nobody has named it, so leave to replace the output is none to replace another
+/// file.
+void Foreman::RequireLeave(const Plan& now, int pieces) const {
+    std::optional<Plan> before;
+    try {
+        before = ReadPlan(order_.planPath);
+    } catch (const Failure& failure) {
+        throw Failure(Category::kOutput,
+                      fmt::format("the plan would replace another file: {}; give the output another name, or "
+                                  "remove that file",
+                                  failure.Text()));
+    }
+    if (pieces > 0 && !order_.replace && Difference(*before, now).empty())
+        throw Failure(Category::kOutput,
+                      fmt::format("{} of {} pieces are left of an earlier run beside \"{}\"", pieces,
+                                  before->Pieces(), order_.planPath),
+                      Reason::kLeftover);
 }
 
 /// The numbers of the pieces that are to be made; the rest first, which takes longest.
@@ -231,7 +272,7 @@ void Foreman::Announce() {
     News().Started({plan_.source.path, order_.only ? PiecePath(order_.planPath, *order_.only) : plan_.output,
                     length_, true});
     if (!leftover_.empty())
-        News().Warned({Warning::Kind::kLeftover, leftover_});
+        News().Warned({Warning::Kind::kChosen, leftover_});
     if (order_.only && missing_.empty())
         News().Warned({Warning::Kind::kChosen, fmt::format("piece {} is made already", *order_.only)});
     if (order_.request && order_.resume && static_cast<int>(missing_.size()) < plan_.Pieces())
@@ -303,31 +344,38 @@ void Foreman::Report() {
     Tell(report);
 }
 
-void Foreman::ReportFinishing(double share) {
+/// Tells how far the joining is; false to end it.
+bool Foreman::FollowJoining(const Joining& latest) {
+    constexpr std::chrono::milliseconds kShortest{100}; // between two reports
+    const bool waits = latest.waitsFor > 0;
+    const bool waited = joining_ && joining_->waitsFor > 0;
+    TickClock(waits);
+    if (Stopped())
+        return false;
+    if (joining_ && waits == waited && WorkClock::Now() - toldAt_ < kShortest)
+        return true;
+    if (waits && !waited)
+        News().Warned({Warning::Kind::kWaitsForRoom,
+                       fmt::format("no space is left for \"{}\"; waiting until there is room for {}",
+                                   plan_.output, FormatBytes(latest.waitsFor))});
+    joining_ = latest;
+    toldAt_ = WorkClock::Now();
     Progress report;
-    report.phase = Phase::kFinishing;
-    report.finished = share;
+    report.phase = waits ? Phase::kWaitingForRoom : Phase::kFinishing;
+    report.finished = latest.share;
     report.position = done_;
     report.bytes = bytes_;
     report.length = length_;
     Tell(report);
+    return true;
 }
 
 void Foreman::JoinAll() {
     CheckAgainst(plan_); // pieces of what was changed meanwhile do not belong together
     if (order_.resume)   // what a killed joining left
         RemoveUnfinished(plan_.output, *order_.request);
-    ReportFinishing(0);
-    double told = 0;
-    Verdict joined = JoinPieces(plan_, order_.planPath, order_.replace, News(), [&](double share) {
-        constexpr double kStep = 0.05;
-        TickClock();
-        if (share >= told + kStep) {
-            told = share;
-            ReportFinishing(share);
-        }
-        return !Stopped();
-    });
+    Verdict joined = JoinPieces(plan_, order_.planPath, {order_.replace, order_.onFull}, News(), Ringer(),
+                                [&](const Joining& latest) { return FollowJoining(latest); });
     TickClock();
     joined.earlier = earlier_;
     joined.worked = Worked();
@@ -335,8 +383,9 @@ void Foreman::JoinAll() {
         joined.outcome = Outcome::kStopped;
         joined.failure.reset();
     }
-    if (joined.outcome == Outcome::kDone && !order_.keepPieces) {
-        RemovePieces(order_.planPath);
+    // Of an output that is there, if larger than asked for, the pieces would give the same again.
+    if (joined.files > 0 && !order_.keepPieces) {
+        RemovePieces(order_.planPath, WholeRequest(plan_));
         if (order_.request) // it was of our own making
             unlink(order_.planPath.c_str());
     }

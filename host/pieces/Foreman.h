@@ -3,6 +3,8 @@
 #define MOVIECONV_HOST_PIECES_FOREMAN_H
 
 #include "host/pieces/Crew.h"
+#include "host/pieces/FileLock.h"
+#include "host/pieces/Joiner.h"
 #include "host/pieces/Plan.h"
 
 #include <deque>
@@ -47,13 +49,17 @@ private:
     void Report() override;
 
     std::optional<Plan> Prepare();
+    Plan ReadGivenPlan() const;
+    void CheckPlaces() const;
     std::optional<Plan> Leftover(const Plan& now);
+    void RequireLeave(const Plan& now, int pieces) const;
     std::deque<int> FindMissing() const;
     std::set<int> TakeLacking();
     void Announce();
     int JobsFor();
-    void ReportFinishing(double share);
+    bool FollowJoining(const Joining& latest);
     void JoinAll();
+    void TellWhatStays();
 
     const PieceOrder order_;
 
@@ -64,9 +70,12 @@ private:
     std::set<int> lacking_; // pieces that lack pictures, so far
 
     // The foreman's thread's.
-    std::deque<int> missing_; // pieces that are to be begun
-    std::set<int> fromStart_; // of these, those for which the source is read from its start
-    std::string leftover_;    // what there is to tell of an earlier run
+    std::optional<PlanLock> lock_;
+    std::deque<int> missing_;        // pieces that are to be begun
+    std::set<int> fromStart_;        // of these, those for which the source is read from its start
+    std::string leftover_;           // what there is to tell of an earlier run
+    std::optional<Joining> joining_; // as it was told last
+    WorkClock::Time toldAt_;
     Verdict verdict_;
     double length_ = 0;  // seconds of all pictures to be converted
     double done_ = 0;    // of the pieces that are made

@@ -1,7 +1,6 @@
 #include "host/pieces/Joiner.h"
 
 #include "api/MovieConv.h"
-#include "host/convert/Bell.h"
 #include "host/convert/CarryOver.h"
 #include "host/convert/EncodePlan.h"
 #include "host/convert/Engine.h"
@@ -11,13 +10,16 @@
 #include "host/convert/OutputCheck.h"
 #include "host/convert/Sources.h"
 #include "host/convert/Timecode.h"
+#include "host/convert/WorkClock.h"
 #include "host/convert/WriterWatch.h"
 #include "host/pieces/PieceFile.h"
 #include "host/source/MediaTime.h"
 #include "media/MediaWriter.h"
 #include "text/Utf8.h"
 
+#include <atomic>
 #include <fmt/format.h>
+#include <future>
 #include <utility>
 #include <vector>
 
@@ -26,11 +28,13 @@ namespace {
 
 constexpr double kCheckingShare = 0.3; // of the time that all of it takes
 
-void CheckPieces(const Plan& plan, const std::string& planPath, const std::function<bool(double)>& goesOn) {
+void CheckPieces(const Plan& plan, const std::string& planPath,
+                 const std::function<bool(const Joining&)>& goesOn) {
     constexpr std::size_t kMostTold = 5;
     std::string faults;
     std::size_t count = 0;
-    for (int number = 0; number < plan.Pieces() && goesOn(double(number) / plan.Pieces()); ++number) {
+    for (int number = 0; number < plan.Pieces() && goesOn({kCheckingShare * number / plan.Pieces(), 0});
+         ++number) {
         const std::string fault = FaultOf(plan, planPath, number);
         if (!fault.empty() && ++count <= kMostTold)
             faults += (faults.empty() ? "" : "; ") + fault;
@@ -41,11 +45,10 @@ void CheckPieces(const Plan& plan, const std::string& planPath, const std::funct
         throw Failure(Category::kSource, faults);
 }
 
-Request JoinRequest(const Plan& plan, bool replace) {
-    Request request = plan.settings;
-    request.input = plan.source.path;
-    request.output = plan.output;
-    request.overwrite = replace;
+Request JoinRequest(const Plan& plan, const JoinOrder& order) {
+    Request request = WholeRequest(plan);
+    request.overwrite = order.replace;
+    request.onFull = order.onFull;
     request.keepPartial = false; // it can be joined again
     request.bitExact = true;     // the multiplexers' numbers of their own are drawn by lot
     return request;
@@ -77,10 +80,64 @@ void Join(const Plan& plan, const std::string& planPath, const Request& request,
                  movie.Sound() != nullptr ? &sound : nullptr, &join);
 }
 
+/// The joining on a thread of its own, which can wait for room while this one hears of a stop.
+class JoiningThread {
+public:
+    JoiningThread(WriterWatch& watch, Bell& bell) : watch_(watch), bell_(bell) {}
+    JoiningThread(const JoiningThread&) = delete;
+    JoiningThread& operator=(const JoiningThread&) = delete;
+    ~JoiningThread() { End(); }
+
+    /// `join` is told what to ask with the share that is done whether to go on.
+    void Start(std::function<void(std::function<bool(double)>)> join) {
+        work_ = std::async(std::launch::async, [this, join = std::move(join)] {
+            const Finally ring(*this);
+            join([this](double share) {
+                share_ = share;
+                return !ends_;
+            });
+        });
+    }
+
+    bool HasEnded() const { return ended_; }
+    double Share() const { return share_; }
+
+    void End() {
+        ends_ = true;
+        watch_.GiveUp();
+    }
+
+    /// Throws what the work has thrown.
+    void Wait() { work_.get(); }
+
+private:
+    class Finally {
+    public:
+        explicit Finally(JoiningThread& thread) : thread_(thread) {}
+        Finally(const Finally&) = delete;
+        Finally& operator=(const Finally&) = delete;
+        ~Finally() {
+            thread_.ended_ = true;
+            thread_.bell_.Ring();
+        }
+
+    private:
+        JoiningThread& thread_;
+    };
+
+    WriterWatch& watch_;
+    Bell& bell_;
+    std::atomic<double> share_{0};
+    std::atomic<bool> ends_{false};
+    std::atomic<bool> ended_{false};
+    std::future<void> work_; // last: it waits for the end
+};
+
 Verdict VerdictOn(const Plan& plan, const Request& request, const FileLedger& files) {
     Verdict verdict;
     verdict.failure = files.FirstFailure();
-    if (const auto missing = verdict.failure ? std::nullopt : files.FindMissing())
+    const std::optional<std::string> missing = files.FindMissing();
+    if (missing && !verdict.failure)
         verdict.failure = Failure(Category::kOutput, *missing);
     if (!verdict.failure && files.Complete() != 1)
         verdict.failure = Failure(Category::kInternal, "the pieces were not joined");
@@ -89,21 +146,20 @@ Verdict VerdictOn(const Plan& plan, const Request& request, const FileLedger& fi
     verdict.outcome = verdict.failure ? Outcome::kFailed : Outcome::kDone;
     verdict.position = ToSeconds(plan.pictures.back().end - plan.pictures.front().begin);
     verdict.bytes = files.Bytes();
-    verdict.files = files.Complete();
+    verdict.files = missing ? 0 : files.Complete();
     return verdict;
 }
 
 } // namespace
 
-Verdict JoinPieces(const Plan& plan, const std::string& planPath, bool replace, Observer& observer,
-                   const std::function<bool(double)>& goesOn) {
-    const Request request = JoinRequest(plan, replace);
+Verdict JoinPieces(const Plan& plan, const std::string& planPath, const JoinOrder& order, Observer& observer,
+                   Bell& bell, const std::function<bool(const Joining&)>& goesOn) {
+    const Request request = JoinRequest(plan, order);
     CheckOutput(request);
-    CheckPieces(plan, planPath, [&](double share) { return goesOn(share * kCheckingShare); });
+    CheckPieces(plan, planPath, goesOn);
     Request reading = request;
     reading.piece.emplace().pictures = false;
     Movie movie = OpenMovie(reading);
-    Bell bell;
     WriterWatch watch(request, movie.Info(), bell);
     FileLedger files(observer);
     const Engine engine =
@@ -116,10 +172,17 @@ Verdict JoinPieces(const Plan& plan, const std::string& planPath, bool replace, 
         while (const auto news = watch.Take())
             files.Enter(*news);
     };
-    Join(plan, planPath, request, movie, engine, [&](double share) {
-        enterNews();
-        return goesOn(kCheckingShare + share * (1 - kCheckingShare));
+    JoiningThread joining(watch, bell);
+    joining.Start([&](std::function<bool(double)> follow) {
+        Join(plan, planPath, request, movie, engine, std::move(follow));
     });
+    while (!joining.HasEnded()) {
+        enterNews();
+        if (!goesOn({kCheckingShare + joining.Share() * (1 - kCheckingShare), watch.WaitsForRoom()}))
+            joining.End();
+        bell.Wait(WorkClock::kTick);
+    }
+    joining.Wait();
     enterNews();
     return VerdictOn(plan, request, files);
 }

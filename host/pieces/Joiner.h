@@ -2,18 +2,33 @@
 #ifndef MOVIECONV_HOST_PIECES_JOINER_H
 #define MOVIECONV_HOST_PIECES_JOINER_H
 
+#include "host/convert/Bell.h"
 #include "host/convert/Observer.h"
 #include "host/pieces/Plan.h"
 
+#include <cstdint>
 #include <functional>
 #include <string>
 
 namespace movieconv {
 
-/// Checks every piece and joins them. `goesOn` is told the share done and may end it; the output's name is
-/// not touched then. Throws Failure; the text names the pieces that do not belong there.
-Verdict JoinPieces(const Plan& plan, const std::string& planPath, bool replace, Observer& observer,
-                   const std::function<bool(double)>& goesOn);
+/// What the output may do to others.
+struct JoinOrder {
+    bool replace = false; ///< It may replace a file.
+    OnFull onFull = OnFull::kStop;
+};
+
+/// How far it is.
+struct Joining {
+    double share = 0;     ///< Done, of checking and writing.
+    int64_t waitsFor = 0; ///< Bytes of room that it waits for on a full disk.
+};
+
+/// Checks every piece and joins them. `goesOn` is told of it on this thread, again and again and whenever
+/// `bell` is rung, and may end it; the output's name is not touched then. Throws Failure; the text names the
+/// pieces that do not belong there.
+Verdict JoinPieces(const Plan& plan, const std::string& planPath, const JoinOrder& order, Observer& observer,
+                   Bell& bell, const std::function<bool(const Joining&)>& goesOn);
 
 } // namespace movieconv
 

@@ -1,15 +1,17 @@
 #include "host/pieces/PieceFile.h"
 
 #include "host/convert/Failure.h"
+#include "host/convert/OutputCheck.h"
 #include "host/pieces/Digest.h"
 #include "host/pieces/WholeFile.h"
 #include "text/Descriptor.h"
+#include "text/FileNames.h"
 #include "text/LastingFile.h"
 #include "text/Path.h"
 
 #include <algorithm>
-#include <cctype>
 #include <cerrno>
+#include <charconv>
 #include <cstring>
 #include <fcntl.h>
 #include <filesystem>
@@ -23,6 +25,7 @@ namespace {
 
 constexpr std::size_t kDigits = 64;
 constexpr std::string_view kSuffix = ".piece";
+constexpr std::string_view kPieceHead = "MCPIECE1"; // with which the media writer begins one
 
 /// The seal without its last line.
 std::string Claim(const Plan& plan, int number, int64_t bytes) {
@@ -34,7 +37,7 @@ std::size_t SealSize(const Plan& plan) {
 }
 
 text::Descriptor OpenForReading(const std::string& path) {
-    return text::Descriptor(open(path.c_str(), O_RDONLY | O_CLOEXEC));
+    return text::Descriptor(open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK)); // a pipe is no piece
 }
 
 /// Bytes of an open file; negative when it cannot be told.
@@ -45,25 +48,46 @@ int64_t SizeOf(const text::Descriptor& file) {
                : -1;
 }
 
-/// Whether it is a piece of a plan of that name, or is becoming one.
-bool IsPieceName(const std::filesystem::path& file, const std::string& planPath) {
+/// The number of the piece whose name a file's begins with, as PiecePath writes it.
+std::optional<int> NumberIn(const std::string& name, const std::string& planPath) {
+    const std::string plan = text::NameOf(planPath) + ".";
+    int number = -1;
+    if (name.starts_with(plan))
+        std::from_chars(name.data() + plan.size(), name.data() + name.size(), number);
+    const bool isNumber =
+        number >= 0 && number <= kMostPieces && name.starts_with(text::NameOf(PiecePath(planPath, number)));
+    return isNumber ? std::optional(number) : std::nullopt;
+}
+
+/// The number of the piece whose name a file has.
+std::optional<int> PieceNumber(const std::filesystem::path& file, const std::string& planPath) {
     const std::string name = file.filename().string();
-    std::string_view rest(name);
-    rest.remove_prefix(std::min(text::NameOf(planPath).size(), rest.size()));
-    if (rest.empty() || rest.front() != '.')
-        return false;
-    rest.remove_prefix(1);
-    const std::size_t digits = std::min(rest.find_first_not_of("0123456789"), rest.size());
-    rest.remove_prefix(digits);
-    return digits >= 4 &&
-           (rest == kSuffix || rest.substr(0, kSuffix.size() + 1) == std::string(kSuffix) + ".");
+    const std::optional<int> number = NumberIn(name, planPath);
+    return number && name == text::NameOf(PiecePath(planPath, *number)) ? number : std::nullopt;
+}
+
+/// A name without what the media writer puts behind it until the file is complete.
+std::string WithoutPartialSuffix(const std::string& name) {
+    const std::size_t end = name.rfind(text::kPartialSuffix);
+    for (int number = 1; end != std::string::npos && number <= text::kMostPartials; ++number)
+        if (name.compare(end, std::string::npos, text::PartialSuffix(number)) == 0)
+            return name.substr(0, end);
+    return name;
+}
+
+/// Whether it is what a process left that was killed while it made a piece.
+bool IsUnfinishedPiece(const std::filesystem::path& file, const std::string& planPath) {
+    const std::string name = WithoutPartialSuffix(file.filename().string());
+    const std::optional<int> number = NumberIn(name, planPath);
+    return number && IsInTheMaking(name, PiecePath(planPath, *number)) && BeginsLike(file, kPieceHead);
 }
 
 /// The files that belong to a plan of that name, but for itself.
 std::vector<std::filesystem::path> FilesOf(const std::string& planPath) {
     std::vector<std::filesystem::path> files = FilesThatBegin(planPath);
     const auto isOther = [&planPath](const std::filesystem::path& file) {
-        return !IsInTheMaking(file, planPath) && !IsPieceName(file, planPath);
+        const bool isPiece = PieceNumber(file, planPath) && BeginsLike(file, kPieceHead);
+        return !isPiece && !IsUnfinishedPiece(file, planPath) && !IsPlanInTheMaking(file, planPath);
     };
     files.erase(std::remove_if(files.begin(), files.end(), isOther), files.end());
     return files;
@@ -73,11 +97,6 @@ std::vector<std::filesystem::path> FilesOf(const std::string& planPath) {
 
 std::string PiecePath(const std::string& planPath, int number) {
     return fmt::format("{}.{:04}{}", planPath, number, kSuffix);
-}
-
-bool PieceExists(const std::string& planPath, int number) {
-    struct stat status {};
-    return stat(PiecePath(planPath, number).c_str(), &status) == 0;
 }
 
 int64_t SealPiece(const std::string& file, const Plan& plan, const std::string& planPath, int number) {
@@ -135,25 +154,36 @@ std::string FaultOf(const Plan& plan, const std::string& planPath, int number) {
     return {};
 }
 
-bool IsPieceOf(const std::string& planPath, const std::string& file) {
-    const auto files = FilesOf(planPath);
-    std::error_code ignored;
-    return std::any_of(files.begin(), files.end(), [&](const std::filesystem::path& piece) {
-        return std::filesystem::equivalent(piece, file, ignored);
-    });
+void RequirePlaces(const std::string& planPath, const Request& request, std::optional<int> only) {
+    for (const std::filesystem::path& file : FilesThatBegin(planPath)) {
+        const std::optional<int> number = PieceNumber(file, planPath);
+        if (!number || (only && number != only))
+            continue;
+        if (const char* role = WhatIsReadFrom(file.string(), request))
+            throw Failure(Category::kRequest,
+                          fmt::format("\"{}\" is {}, and has the name of a piece that is to "
+                                      "be made; rename it, or give the output another name",
+                                      file.string(), role));
+        if (!BeginsLike(file, kPieceHead))
+            throw Failure(Category::kOutput,
+                          fmt::format("a piece would replace another file, \"{}\"; rename or "
+                                      "remove it, or give the output another name",
+                                      file.string()));
+    }
 }
 
 int CountPieces(const std::string& planPath) {
     const auto files = FilesOf(planPath);
-    return static_cast<int>(std::count_if(files.begin(), files.end(), [](const std::filesystem::path& file) {
-        return file.extension() == kSuffix;
+    return static_cast<int>(std::count_if(files.begin(), files.end(), [&](const std::filesystem::path& file) {
+        return PieceNumber(file, planPath).has_value();
     }));
 }
 
-void RemovePieces(const std::string& planPath) {
+void RemovePieces(const std::string& planPath, const Request& request) {
     std::error_code ignored;
     for (const std::filesystem::path& file : FilesOf(planPath))
-        std::filesystem::remove(file, ignored);
+        if (WhatIsReadFrom(file.string(), request) == nullptr)
+            std::filesystem::remove(file, ignored);
 }
 
 } // namespace movieconv

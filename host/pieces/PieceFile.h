@@ -25,17 +25,16 @@ int64_t SealPiece(const std::string& file, const Plan& plan, const std::string& 
 /// Reads all of it.
 std::string FaultOf(const Plan& plan, const std::string& planPath, int number);
 
-/// Whether there is a file of that name at all.
-bool PieceExists(const std::string& planPath, int number);
-
-/// Whether a file that exists has the place of a piece of a plan of that name.
-bool IsPieceOf(const std::string& planPath, const std::string& file);
+/// Throws Failure when something that is no piece, or that `request` reads, has the place of a piece of a
+/// plan of that name: of this one, or of any.
+void RequirePlaces(const std::string& planPath, const Request& request, std::optional<int> only);
 
 /// How many pieces stand beside a plan's name, whosever they are.
 int CountPieces(const std::string& planPath);
 
-/// Removes all pieces beside the plan, and what was in the making.
-void RemovePieces(const std::string& planPath);
+/// Removes all pieces beside the plan, and what was in the making; nothing else whatever it is called, and
+/// nothing that `request` reads.
+void RemovePieces(const std::string& planPath, const Request& request);
 
 } // namespace movieconv
 

@@ -6,6 +6,7 @@
 #include "host/convert/Request.h"
 
 #include <cstdint>
+#include <filesystem>
 #include <functional>
 #include <map>
 #include <optional>
@@ -93,6 +94,12 @@ Plan ReadPlan(const std::string& path);
 
 /// Writes it in one step, and to the disk; sets its hash. Throws Failure.
 void WritePlan(const std::string& path, Plan& plan);
+
+/// Whether a file is what WritePlan left of a plan of that name when it was killed.
+bool IsPlanInTheMaking(const std::filesystem::path& file, const std::string& path);
+
+/// What names the files that the plan's conversion reads, and its output.
+Request WholeRequest(const Plan& plan);
 
 /// The conversion that makes a piece, 0 to Pieces() - 1, into the file `output`.
 Request RequestFor(const Plan& plan, int number, const std::string& output);

@@ -17,6 +17,8 @@ namespace {
 
 constexpr int kVersion = 1;
 constexpr int64_t kLargestPlan = 16 << 20;
+constexpr int kIndent = 2;
+constexpr std::string_view kPlanHead = "{\n  \"version\": "; // with which AsJson begins
 
 Json AsJson(const Piece& piece) {
     Json json{{"kind", "pictures"},
@@ -172,7 +174,11 @@ void WritePlan(const std::string& path, Plan& plan) {
     Json json = AsJson(plan);
     plan.hash = HashOf(json);
     json["hash"] = plan.hash;
-    WriteWhole(path, json.dump(2) + "\n");
+    WriteWhole(path, json.dump(kIndent) + "\n");
+}
+
+bool IsPlanInTheMaking(const std::filesystem::path& file, const std::string& path) {
+    return IsInTheMaking(file, path) && BeginsLike(file, kPlanHead);
 }
 
 std::string Difference(const Plan& before, const Plan& now) {

@@ -278,7 +278,7 @@ std::optional<Plan> MakePlan(Plan plan, const std::function<bool()>& stopped) {
 }
 
 std::string TellBitRate(const Plan& plan) {
-    if (!plan.hasRates)
+    if (!plan.hasRates || plan.pictures.size() == 1)
         return {};
     const double seconds = ToSeconds(plan.pictures.back().end - plan.pictures.front().begin) /
                            static_cast<double>(plan.pictures.size());
@@ -288,9 +288,15 @@ std::string TellBitRate(const Plan& plan) {
         plan.pictures.size(), seconds);
 }
 
-Request RequestFor(const Plan& plan, int number, const std::string& output) {
+Request WholeRequest(const Plan& plan) {
     Request request = plan.settings;
     request.input = plan.source.path;
+    request.output = plan.output;
+    return request;
+}
+
+Request RequestFor(const Plan& plan, int number, const std::string& output) {
+    Request request = WholeRequest(plan);
     request.output = output;
     request.overwrite = true; // whatever was left there
     request.keepPartial = false;

@@ -6,6 +6,7 @@
 #include "text/Path.h"
 #include "text/WriteAll.h"
 
+#include <algorithm>
 #include <array>
 #include <cerrno>
 #include <cstring>
@@ -78,6 +79,17 @@ bool IsInTheMaking(const std::filesystem::path& file, const std::string& path) {
     const std::size_t number = name.find_last_not_of("0123456789") + 1;
     return name.compare(0, prefix.size(), prefix) == 0 && number > prefix.size() && number < name.size() &&
            name[number - 1] == '-';
+}
+
+bool BeginsLike(const std::filesystem::path& file, std::string_view head) {
+    const text::Descriptor opened(open(file.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK));
+    struct stat status {};
+    if (opened.Number() < 0 || fstat(opened.Number(), &status) != 0 || !S_ISREG(status.st_mode))
+        return false;
+    const auto length = std::min(head.size(), static_cast<std::size_t>(status.st_size));
+    std::string beginning(length, ' ');
+    return pread(opened.Number(), beginning.data(), length, 0) == static_cast<ssize_t>(length) &&
+           beginning == head.substr(0, length);
 }
 
 std::vector<std::filesystem::path> FilesThatBegin(const std::string& path) {

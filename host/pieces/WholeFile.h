@@ -23,8 +23,12 @@ void AppendWhole(const std::string& path, std::string_view text);
 /// A name beside `path` that no other process on any machine takes for the same purpose.
 std::string NameInTheMaking(const std::string& path);
 
-/// Whether the file has such a name: it is being made, or was left by a process that was killed.
+/// Whether the file has such a name: it is being made, or was left by a process that was killed. Others can
+/// have such names, too; see BeginsLike.
 bool IsInTheMaking(const std::filesystem::path& file, const std::string& path);
+
+/// Whether it is a file that begins with `head`, or with as much of it as it is long.
+bool BeginsLike(const std::filesystem::path& file, std::string_view head);
 
 /// All whose paths begin so, as far as the folder can be read.
 std::vector<std::filesystem::path> FilesThatBegin(const std::string& path);

@@ -17,6 +17,8 @@ const char* AdviceFor(Reason reason) {
         return "; see --allow-playlists";
     case Reason::kUnknownLength:
         return "; use --length";
+    case Reason::kLeftover:
+        return "; --resume goes on with it, --overwrite makes it anew";
     case Reason::kCannotResume:
         return "; without --resume it is made anew";
     case Reason::kNoMemory:
@@ -67,7 +69,7 @@ std::string Explain(const Warning& warning) {
     case Warning::Kind::kWaitsForRoom:
         return warning.text + ", Ctrl-C gives up";
     case Warning::Kind::kLeftover:
-        return warning.text + "; --resume goes on with it";
+        return warning.text + "; the same command with --resume goes on with them";
     default:
         return warning.text;
     }

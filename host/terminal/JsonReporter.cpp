@@ -30,6 +30,11 @@ std::string_view PhaseName(Phase phase) {
     return "converting";
 }
 
+/// The field that tells which of many movies it is; none where there is but one.
+std::string InputField(const std::string& input) {
+    return input.empty() ? "" : fmt::format(",\"input\":{}", JsonString(input));
+}
+
 } // namespace
 
 std::string EscapeCommands(std::string_view json) {
@@ -95,24 +100,26 @@ void JsonReporter::Progressed(const Progress& report) {
 }
 
 void JsonReporter::Opened(const OpenedFile& report) {
-    Print("clip_opened", fmt::format("\"number\":{},\"path\":{}", report.number, JsonString(report.path)));
+    Print("clip_opened", fmt::format("\"number\":{},\"path\":{}{}", report.number, JsonString(report.path),
+                                     InputField(report.input)));
 }
 
 void JsonReporter::Closed(const ClosedFile& report) {
-    Print("clip_closed", fmt::format("\"number\":{},\"path\":{},\"video_s\":{},\"audio_s\":{},\"bytes\":{}",
+    Print("clip_closed", fmt::format("\"number\":{},\"path\":{},\"video_s\":{},\"audio_s\":{},\"bytes\":{}{}",
                                      report.number, JsonString(report.path), Number(report.videoSeconds),
-                                     Number(report.audioSeconds), report.bytes));
+                                     Number(report.audioSeconds), report.bytes, InputField(report.input)));
 }
 
 void JsonReporter::LeftBehind(const NotCarried& report) {
     Print("not_carried",
-          fmt::format("\"kind\":{},\"number\":{},\"codec\":{},\"language\":{},\"reason\":{}",
+          fmt::format("\"kind\":{},\"number\":{},\"codec\":{},\"language\":{},\"reason\":{}{}",
                       JsonString(report.kind), report.number ? std::to_string(*report.number) : "null",
-                      JsonString(report.codec), JsonString(report.language), JsonString(report.reason)));
+                      JsonString(report.codec), JsonString(report.language), JsonString(report.reason),
+                      InputField(report.input)));
 }
 
-void JsonReporter::Warn(const std::string& text) {
-    Print("warning", fmt::format("\"text\":{}", JsonString(text)));
+void JsonReporter::Warn(const std::string& text, const std::string& input) {
+    Print("warning", fmt::format("\"text\":{}{}", JsonString(text), InputField(input)));
 }
 
 void JsonReporter::Error(const std::string& text) {

@@ -22,7 +22,7 @@ public:
     void Opened(const OpenedFile& report) override;
     void Closed(const ClosedFile& report) override;
     void LeftBehind(const NotCarried& report) override;
-    void Warn(const std::string& text) override;
+    void Warn(const std::string& text, const std::string& input) override;
     void Error(const std::string& text) override;
     void End(const EndReport& report) override;
 

@@ -26,10 +26,11 @@ struct EndReport {
 /// The main thread's. The defaults tell nothing.
 class Reporter : public Observer {
 public:
-    void Warned(const Warning& news) final { Warn(Explain(news)); }
+    void Warned(const Warning& news) final { Warn(Explain(news), news.input); }
     void Ended(const Verdict& verdict) final;
 
-    virtual void Warn(const std::string&) {}
+    /// `input`: of which of many movies; otherwise empty.
+    virtual void Warn(const std::string& /*text*/, const std::string& /*input*/) {}
 
     /// Leaves the terminal line before something else writes to the terminal.
     virtual void LeaveLine() {}

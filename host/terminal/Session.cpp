@@ -71,6 +71,8 @@ Session::Session(const Options& options, const StandardStreams& streams, MainLoo
       work_(MakeWork(options, *this, [&loop](std::function<void()> work) { loop.Post(std::move(work)); })) {}
 
 ExitCode Session::Run() {
+    if (options_.jobs || options_.into || options_.task != Task::kConvert)
+        Arm(); // a stop ends this before the first conversion starts, too
     work_->Start();
     while (!code_) {
         const bool quiet = !loop_.RunNext(kTick);
@@ -85,11 +87,16 @@ void Session::Started(const Start& news) {
     started_ = true;
     if (options_.preview)
         preview_.emplace(*options_.preview, options_.request.overwrite);
-    control_.Arm(options_.progress == ProgressStyle::kBar && !options_.quiet,
-                 [this](Command command) { Obey(command); });
+    Arm();
     reporter_->Started(news); // whoever reads this may send signals
     for (const std::string& complaint : options_.complaints)
-        reporter_->Warn(complaint);
+        reporter_->Warn(complaint, {});
+}
+
+void Session::Arm() {
+    if (!std::exchange(armed_, true))
+        control_.Arm(options_.progress == ProgressStyle::kBar && !options_.quiet,
+                     [this](Command command) { Obey(command); });
 }
 
 void Session::Progressed(const Progress& news) {
@@ -97,7 +104,8 @@ void Session::Progressed(const Progress& news) {
 }
 
 void Session::Opened(const OpenedFile& news) {
-    control_.NoteFile(news.temporaryPath);
+    if (news.input.empty()) // of many, several are open
+        control_.NoteFile(news.temporaryPath);
     reporter_->Opened(news);
 }
 
@@ -124,7 +132,7 @@ void Session::Ended(const Verdict& news) {
         throw Failure(*news.failure);
     if (preview_) {
         if (const std::string failure = preview_->Finish(); !failure.empty())
-            reporter_->Warn(failure);
+            reporter_->Warn(failure, {});
     }
     reporter_->Ended(news);
     code_ = CodeOf(news);

@@ -34,6 +34,7 @@ public:
     void Ended(const Verdict& news) override;
 
 private:
+    void Arm();
     void Obey(Command command);
 
     const Options& options_;
@@ -41,6 +42,7 @@ private:
     ControlInput& control_;
     const std::unique_ptr<Reporter> reporter_;
     std::optional<Preview> preview_;
+    bool armed_ = false;
     bool started_ = false;
     bool paused_ = false;
     std::optional<ExitCode> code_;

@@ -2,8 +2,10 @@
 
 #include "host/convert/Failure.h"
 #include "host/convert/OutputCheck.h"
+#include "host/pieces/BatchJournal.h"
 #include "host/terminal/Preview.h"
 #include "text/FileNames.h"
+#include "text/Path.h"
 
 #include <algorithm>
 #include <fmt/format.h>
@@ -20,11 +22,19 @@ bool IsFurtherInput(const std::string& path, const Options& options) {
                                         [&](const std::string& input) { return AreSame(path, input); }));
 }
 
+/// With --into, also before it is there.
+bool IsJournal(const std::string& path, const Options& options) {
+    return options.into && text::NameOf(path) == BatchJournal::kName &&
+           AreSame(text::FolderOf(path), *options.into);
+}
+
 void CheckSideFile(const char* option, const std::string& path, const Options& options) {
     const Request& request = options.request;
     const char* other = IsFurtherInput(path, options) ? "the source itself" : WhatIsReadFrom(path, request);
     if (other == nullptr && !request.output.empty() && IsOutput(path, request))
         other = "the output or a part of it";
+    if (IsJournal(path, options))
+        other = "the journal of what is converted into that folder";
     if (other != nullptr) {
         throw Failure(Category::kRequest,
                       fmt::format("{} \"{}\" is {}; give it another name", option, path, other));

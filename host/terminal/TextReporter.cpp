@@ -55,6 +55,11 @@ std::string_view NameForUsers(std::string_view codec) {
     return codec;
 }
 
+/// What to put before a text about one of many movies, unless it names it.
+std::string Whose(const std::string& input, const std::string& text) {
+    return input.empty() || text.find(input) != std::string::npos ? "" : fmt::format("\"{}\": ", input);
+}
+
 } // namespace
 
 std::string ProgressText(const Progress& report, int columns) {
@@ -82,8 +87,8 @@ void QuietReporter::Error(const std::string& text) {
     streams_.PrintError(fmt::format("movieconv: error: {}", text));
 }
 
-void SparseReporter::Warn(const std::string& text) {
-    Streams().PrintError(fmt::format("movieconv: warning: {}", text));
+void SparseReporter::Warn(const std::string& text, const std::string& input) {
+    Streams().PrintError(fmt::format("movieconv: warning: {}{}", Whose(input, text), text));
 }
 
 void SparseReporter::LeftBehind(const NotCarried& report) {
@@ -94,8 +99,8 @@ void SparseReporter::LeftBehind(const NotCarried& report) {
     if (!details.empty())
         details = " (" + details + ")";
     LeaveLine();
-    Streams().PrintError(
-        fmt::format("movieconv: not carried: {}{}{}: {}", report.kind, number, details, report.reason));
+    Streams().PrintError(fmt::format("movieconv: not carried: {}{}{}{}: {}", Whose(report.input, {}),
+                                     report.kind, number, details, report.reason));
 }
 
 void SparseReporter::End(const EndReport& report) {
@@ -141,9 +146,9 @@ void BarReporter::Closed(const ClosedFile& report) {
     LineReporter::Closed(report);
 }
 
-void BarReporter::Warn(const std::string& text) {
+void BarReporter::Warn(const std::string& text, const std::string& input) {
     EraseLine();
-    LineReporter::Warn(text);
+    LineReporter::Warn(text, input);
 }
 
 void BarReporter::Error(const std::string& text) {

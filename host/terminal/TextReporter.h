@@ -25,7 +25,7 @@ private:
 class SparseReporter : public QuietReporter {
 public:
     using QuietReporter::QuietReporter;
-    void Warn(const std::string& text) override;
+    void Warn(const std::string& text, const std::string& input) override;
     void LeftBehind(const NotCarried& report) override;
     void End(const EndReport& report) override;
 };
@@ -48,7 +48,7 @@ public:
     BarReporter(const StandardStreams& streams, bool colour) : LineReporter(streams), colour_(colour) {}
     void Progressed(const Progress& report) override;
     void Closed(const ClosedFile& report) override;
-    void Warn(const std::string& text) override;
+    void Warn(const std::string& text, const std::string& input) override;
     void Error(const std::string& text) override;
     void End(const EndReport& report) override;
     void LeaveLine() override;

@@ -5,7 +5,11 @@
 
 #include <gtest/gtest.h>
 
+#include <csignal>
 #include <filesystem>
+#include <map>
+#include <regex>
+#include <set>
 #include <string>
 #include <sys/stat.h>
 #include <vector>
@@ -14,11 +18,18 @@ namespace {
 
 using program::Call;
 using program::Result;
+using program::Running;
 using test_movies::Args;
 
 std::string Short() {
     return test_movies::Make("many.mkv",
                              test_movies::Join(test_movies::CountedPictures(1), test_movies::Beeps(1)));
+}
+
+/// A source that takes long enough to be met at work.
+std::string Lasting() {
+    return test_movies::Make("many-lasting.mkv", {"-f", "lavfi", "-i", "testsrc2=s=640x360:r=25:d=30", "-c:v",
+                                                  "libx264", "-preset", "ultrafast"});
 }
 
 /// A folder "in" of two movies and a text, and a movie beside it.
@@ -202,6 +213,97 @@ TEST(ManyMovies, NeedNamesOfTheirOwn) {
     EXPECT_EQ(Call({"--into", movies.folder / "in", movies.folder / "in"}).code, 2);
     EXPECT_EQ(Call({"--into", movies.out, "--split", "2", movies.folder / "c.mkv"}).code, 2);
     EXPECT_EQ(Call({movies.folder / "c.mkv", movies.folder / "d.mp4", movies.folder / "in/a.mkv"}).code, 2);
+}
+
+TEST(ManyMovies, TakeNoNamesFromWhatIsNone) {
+    const Movies movies;
+    WriteFile(movies.folder / "in/a.nfo", "about it");
+    WriteFile(movies.folder / "in/a.srt", "1\n00:00:00,000 --> 00:00:01,000\nA cue\n");
+    const Result result = movies.Convert();
+    EXPECT_EQ(result.code, 0) << result.err;
+    EXPECT_TRUE(Has(result.err, "a.nfo\" is left out") && Has(result.err, "a.srt\" is left out"))
+        << result.err;
+    WriteFile(movies.folder / "in/a.mka", ReadFile(Short()));
+    const Result twice = movies.Convert();
+    EXPECT_EQ(twice.code, 2);
+    EXPECT_TRUE(Has(twice.err, "would both become")) << twice.err;
+}
+
+TEST(ManyMovies, AreNamedByWhatIsToldOfThem) {
+    const Movies movies;
+    const std::string source = movies.folder / "d.mkv";
+    ASSERT_EQ(program::Run({"ffmpeg", "-v", "error", "-i", Short(), "-c", "copy", "-attach",
+                            movies.folder / "in/notes.txt", "-metadata:s:t", "mimetype=text/plain", source})
+                  .code,
+              0);
+    const Result json = movies.Convert({"--progress", "json", source});
+    ASSERT_EQ(json.code, 0) << json.err;
+    const std::regex pattern(R"re("event":"(\w+)"(?:,"number":(\d))?.*"input":".*/(\w+)\.\w+")re");
+    std::map<std::string, std::set<std::string>> told; // by event
+    std::set<std::string> numbers;
+    for (std::sregex_iterator line(json.out.begin(), json.out.end(), pattern), end; line != end; ++line) {
+        told[(*line)[1]].insert((*line)[2].str() + (*line)[3].str());
+        numbers.insert((*line)[2]);
+    }
+    EXPECT_EQ(told["clip_opened"].size(), 4U) << json.out;
+    EXPECT_EQ(told["clip_opened"], told["clip_closed"]) << json.out;
+    EXPECT_EQ(numbers, (std::set<std::string>{"", "1", "2", "3", "4"})) << json.out;
+    EXPECT_EQ(told["not_carried"], std::set<std::string>{"d"}) << json.out;
+    EXPECT_EQ(told["warning"], std::set<std::string>{"notes"}) << json.out;
+
+    std::filesystem::remove_all(movies.out);
+    const Result text = movies.Convert({source});
+    EXPECT_TRUE(Has(text.err, "not carried: \"" + source + "\": attachment")) << text.err;
+}
+
+/// The mark of a playlist does not tell what its parts are.
+TEST(ManyMovies, ThatArePlaylistsAreMadeAnew) {
+    const Folder folder;
+    const std::string list = folder / "list.ffconcat";
+    WriteFile(list, "ffconcat version 1.0\nfile part.mkv\n");
+    WriteFile(folder / "part.mkv", ReadFile(Short()));
+    const Args convert{"--allow-playlists", "--into", folder / "out", list};
+    ASSERT_EQ(Call(convert).code, 0);
+    const std::string before = ReadFile(folder / "out/list.mp4");
+    WriteFile(folder / "part.mkv", ReadFile(Lasting()));
+    const Result again = Call(convert);
+    EXPECT_EQ(again.code, 0) << again.err;
+    EXPECT_TRUE(Has(again.err, "is made anew: it was made of a playlist")) << again.err;
+    EXPECT_FALSE(ReadFile(folder / "out/list.mp4") == before);
+}
+
+TEST(ManyMovies, LeaveNothingUnfinishedAfterKills) {
+    const Folder folder;
+    const std::string out = folder / "out";
+    const std::string source = folder / "long.mkv";
+    WriteFile(source, ReadFile(Lasting()));
+    const Args convert{"--progress", "json", "--into", out, source};
+    const auto kill = [&] {
+        Running killed(convert, false);
+        EXPECT_TRUE(killed.WaitFor(R"("event":"clip_opened")"));
+        killed.Signal(SIGKILL);
+        killed.Finish();
+    };
+    kill();
+    kill();
+    EXPECT_EQ(folder.Names("out"), (std::vector<std::string>{"long.mp4.part", "movieconv.journal"}));
+    Running first(convert, false);
+    ASSERT_TRUE(first.WaitFor(R"("event":"clip_opened")"));
+    first.Signal(SIGSTOP);
+    kill();
+    EXPECT_TRUE(std::filesystem::exists(out + "/long.mp4.part")) << "which the first one is writing";
+    first.Signal(SIGCONT);
+    const Result result = first.Finish();
+    EXPECT_EQ(result.code, 0) << result.out << result.err;
+}
+
+TEST(ManyMovies, KeepTheirJournalFromBeingALog) {
+    const Movies movies;
+    std::filesystem::create_directory(movies.out);
+    const Result result = movies.Convert({"--log", movies.out + "/movieconv.journal"});
+    EXPECT_EQ(result.code, 2);
+    EXPECT_TRUE(Has(result.err, "is the journal of what is converted")) << result.err;
+    EXPECT_TRUE(std::filesystem::is_empty(movies.out));
 }
 
 } // namespace

@@ -245,7 +245,7 @@ TEST(Pieces, LeaveTheirSourceWhateverItIsCalled) {
     } cases[] = {{".part", {"--jobs", "1", "--resume"}, 0},
                  {".plan", {"--jobs", "1", "-y"}, kCannotWrite},
                  {".plan.0000.piece", {"--jobs", "1", "-y"}, kUsage},
-                 {".plan.making-desk-7", {"--jobs", "1", "-y"}, kUsage},
+                 {".plan.making-desk-7", {"--jobs", "1", "-y"}, 0},
                  {".clips", {"--split", "4", "-y"}, kCannotWrite}};
     for (const auto& test : cases) {
         const std::string source = output + test.name;
@@ -257,6 +257,48 @@ TEST(Pieces, LeaveTheirSourceWhateverItIsCalled) {
         std::filesystem::remove(output);
     }
     EXPECT_TRUE(folder.Names().empty());
+}
+
+/// What else stands there under names that conversions in pieces use, or nearly so. Only what they made is
+/// theirs.
+TEST(Pieces, RemoveNothingButWhatTheyMade) {
+    const Planned farm;
+    farm.MakeAll();
+    const std::string output = farm.folder / "out.mp4";
+    const std::string cue = "1\n00:00:01,000 --> 00:00:03,000\nA cue\n";
+    const struct {
+        const char* name;
+        std::string content;
+        int code;
+        bool stays;
+    } cases[] = {{".0000.piece", cue, kUsage, true}, // which is read
+                 {".0001.piece", cue, kCannotWrite, true},
+                 {".0001.piece", ReadFile(farm.Piece(1)).substr(0, 5000), 0, false},
+                 {".0001.piece", "", 0, false},
+                 {".0001.piece.mine", ReadFile(farm.Piece(1)), 0, true},
+                 {".00001.piece", ReadFile(farm.Piece(1)), 0, true},
+                 {".0001.piece.making-desk-7.part2", ReadFile(farm.Piece(1)), 0, false},
+                 {".0001.piece.making-desk-7", "MCP", 0, false},
+                 {".0001.piece.making-of-2024-1", ReadFile(Source()), 0, true},
+                 {".0001.piece.making-desk-7.part.mine", ReadFile(farm.Piece(1)), 0, true},
+                 {".making-of-2024-1", ReadFile(Source()), 0, true},
+                 {".making-desk-7", ReadFile(farm.plan).substr(0, 100), 0, false}};
+    for (const auto& test : cases) {
+        const std::string file = output + ".plan" + test.name;
+        WriteFile(file, test.content);
+        Args options{"-q", "--jobs", "1", Source(), output};
+        if (test.code == kUsage)
+            options.insert(options.end(), {"--subtitle-file", file});
+        const Result result = Call(options);
+        EXPECT_EQ(result.code, test.code) << test.name << result.err;
+        EXPECT_EQ(std::filesystem::exists(file), test.stays) << test.name;
+        EXPECT_TRUE(ReadFile(file) == (test.stays ? test.content : "")) << test.name;
+        std::filesystem::remove(file);
+        std::filesystem::remove(output);
+    }
+    WriteFile(farm.Piece(1), "precious");
+    EXPECT_EQ(farm.Make(1).code, kCannotWrite);
+    EXPECT_EQ(ReadFile(farm.Piece(1)), "precious");
 }
 
 // Values that are nested very deep take the stack of whoever copies or prints them.
@@ -286,6 +328,74 @@ TEST(Pieces, EndOnASignalWithCodeSixAndLeaveNothing) {
     const Result result = piece.Finish();
     EXPECT_EQ(result.code, kStopped) << result.out << result.err;
     EXPECT_EQ(folder.Names(), (std::vector<std::string>{"movie.plan"}));
+}
+
+TEST(Pieces, ThatAreStoppedAreNoOutputAndToldToStay) {
+    const Folder folder;
+    const std::string output = folder / "out.mp4";
+    Running run({"--progress", "json", "--jobs", "1", "--pieces", "8", LongSource(), output}, false);
+    ASSERT_TRUE(run.WaitFor(R"("position_s":[123][0-9]\.)")); // behind the first of 5 s
+    run.Signal(SIGTERM);
+    const Result result = run.Finish();
+    EXPECT_EQ(result.code, kStopped) << result.err;
+    EXPECT_TRUE(Has(result.out, R"("bytes":0,"files":0)")) << result.out;
+    EXPECT_TRUE(Has(result.out, "pieces are made and stay") && Has(result.out, "--resume")) << result.out;
+    EXPECT_FALSE(std::filesystem::exists(output));
+    EXPECT_TRUE(std::filesystem::exists(output + ".plan"));
+}
+
+/// A plan is being made; its lock tells that the program runs.
+TEST(Pieces, EndWithCodeSixOnASignalBeforeTheFirstIsBegun) {
+    const Folder folder;
+    const std::string output = folder / "out.mp4";
+    Running run({"-q", "--jobs", "1", LongSource(), output}, false);
+    while (!std::filesystem::exists(output + ".plan.lock") && !run.HasEnded())
+        usleep(200);
+    run.Signal(SIGTERM);
+    const Result result = run.Finish();
+    EXPECT_EQ(result.code, kStopped) << result.err;
+    EXPECT_FALSE(std::filesystem::exists(output + ".plan.lock"));
+}
+
+TEST(Pieces, OfOneOutputAreMadeByOneRunAtATime) {
+    const Folder folder;
+    const Args make{"--progress", "json",       "--jobs",          "1", "--pieces", "8",
+                    "-y",         LongSource(), folder / "out.mp4"};
+    Running first(make, false);
+    ASSERT_TRUE(first.WaitFor(R"("event":"progress")"));
+    const Result second = Call(make);
+    EXPECT_EQ(second.code, kCannotWrite);
+    EXPECT_TRUE(Has(second.err, "another run is working on")) << second.err;
+    const Result result = first.Finish();
+    EXPECT_EQ(result.code, 0) << result.out << result.err;
+    EXPECT_EQ(folder.Names(), (std::vector<std::string>{"out.mp4"}));
+}
+
+TEST(Pieces, WaitForRoomForTheirOutputUntilThereIsOrAStop) {
+    const Folder folder;
+    const SmallDisk disk(folder / "disk", "200k");
+    if (!disk.IsThere())
+        GTEST_SKIP() << "no file system can be mounted here";
+    const std::string plan = folder / "movie.plan";
+    ASSERT_EQ(Call({"-q", "--plan", plan, "--pieces", "1", LongSource(), folder / "disk/out.mp4"}).code, 0);
+    for (const char* number : {"0", "1"})
+        ASSERT_EQ(Call({"-q", "--piece", number, plan}).code, 0);
+    const Args join{"--progress", "json", "--on-full", "wait", "--join", plan};
+    {
+        Running stopped(join, false);
+        ASSERT_TRUE(stopped.WaitFor("waiting_for_room"));
+        stopped.Signal(SIGTERM);
+        const Result result = stopped.Finish();
+        EXPECT_EQ(result.code, kStopped) << result.out << result.err;
+        EXPECT_TRUE(Has(result.out, "waiting until there is room for")) << result.out;
+        EXPECT_TRUE(folder.Names("disk").empty());
+    }
+    Running waiting(join, false);
+    ASSERT_TRUE(waiting.WaitFor("waiting_for_room"));
+    ASSERT_TRUE(disk.Grow());
+    const Result result = waiting.Finish();
+    EXPECT_EQ(result.code, 0) << result.out << result.err;
+    EXPECT_EQ(folder.Names("disk"), (std::vector<std::string>{"out.mp4"}));
 }
 
 TEST(Pieces, OfASourceThatIsWrittenToMeanwhileAreNotJoined) {
@@ -376,13 +486,16 @@ TEST(Pieces, ResumeOnlyTheSameConversionAndTellWhatDiffers) {
         Call(test_movies::Join(options, Args{"--resume", "--size", "80x60", Source(), farm.output}));
     EXPECT_EQ(other.code, kUsage);
     EXPECT_TRUE(Has(other.err, "settings size was nothing, now [80,60]")) << other.err;
+    const Result unasked = Call(test_movies::Join(options, Args{Source(), farm.output}));
+    EXPECT_EQ(unasked.code, kCannotWrite);
+    EXPECT_TRUE(Has(unasked.err, "1 of 5 pieces are left") && Has(unasked.err, "--resume")) << unasked.err;
     const Result resumed =
         Call(test_movies::Join(options, Args{"--resume", "--keep-pieces", Source(), farm.output}));
     EXPECT_EQ(resumed.code, 0);
     EXPECT_TRUE(Has(resumed.err, "1 of 5 pieces are made already")) << resumed.err;
     const Result anew = Call(test_movies::Join(options, Args{"-y", Source(), farm.output}));
     EXPECT_EQ(anew.code, 0);
-    EXPECT_TRUE(Has(anew.err, "with 5 pieces is left of an earlier run")) << anew.err;
+    EXPECT_TRUE(Has(anew.err, "with 5 pieces was left of an earlier run")) << anew.err;
     EXPECT_FALSE(std::filesystem::exists(plan));
 }
 
@@ -392,6 +505,26 @@ TEST(Pieces, AreNoWayAroundALargestSize) {
                                 LongSource(), folder / "out.mp4"});
     EXPECT_EQ(result.code, kCannotWrite) << result.err;
     EXPECT_TRUE(Has(result.err, "has become larger than asked for")) << result.err;
+    EXPECT_EQ(folder.Names(), (std::vector<std::string>{"out.mp4"})) << "pieces would give the same again";
+}
+
+TEST(Pieces, CostNothingWhereThereIsOne) {
+    const Folder folder;
+    const Result result = Call({"--jobs", "1", "--pieces", "1", Source(), folder / "out.mp4"});
+    EXPECT_EQ(result.code, 0) << result.err;
+    EXPECT_FALSE(Has(result.err, "the bit rate begins anew")) << result.err;
+}
+
+/// The files that pieces are made in have longer names than the output.
+TEST(Pieces, OfOutputsWithLongNamesAreRefusedBeforeAnythingIsRead) {
+    const Folder folder;
+    for (const std::size_t length : {std::size_t{247}, std::size_t{225}}) {
+        const std::string output = folder / (std::string(length, 'n') + ".mp4");
+        const Result result = Call({"-q", "--jobs", "1", Source(), output});
+        EXPECT_EQ(result.code, kCannotWrite) << result.err;
+        EXPECT_TRUE(Has(result.err, "is too long for a conversion in pieces")) << result.err;
+        EXPECT_TRUE(folder.Names().empty());
+    }
 }
 
 TEST(Pieces, TellWhatIsLeftOnceTheyHaveStarted) {
@@ -400,7 +533,7 @@ TEST(Pieces, TellWhatIsLeftOnceTheyHaveStarted) {
     const Result result =
         Call({"--progress", "json", "--jobs", "1", "--pieces", "2", "-y", Source(), farm.output});
     EXPECT_EQ(result.code, 0);
-    EXPECT_TRUE(Has(result.out, "is left of an earlier run")) << result.out;
+    EXPECT_TRUE(Has(result.out, "was left of an earlier run")) << result.out;
     EXPECT_TRUE(Has(result.out.substr(0, result.out.find('\n')), R"("event":"start")")) << result.out;
 }
 

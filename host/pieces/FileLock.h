@@ -1,0 +1,48 @@
+// Keeps two processes from working on the same files at once.
+#ifndef MOVIECONV_HOST_PIECES_FILELOCK_H
+#define MOVIECONV_HOST_PIECES_FILELOCK_H
+
+#include "text/Descriptor.h"
+
+#include <optional>
+#include <string>
+
+namespace movieconv {
+
+/// Holds a file that is there, if nobody else does, for as long as the object exists. A process that is
+/// killed holds nothing any more.
+class FileLock {
+public:
+    enum class State {
+        kHeld,
+        kElsewhere, ///< Another process holds it, or another FileLock.
+        kUnknown,   ///< There is none, or its file system knows no locks.
+    };
+
+    explicit FileLock(const std::string& path);
+    State Result() const { return state_; }
+
+private:
+    const text::Descriptor file_;
+    const State state_;
+};
+
+/// The right to work on a plan and its pieces: an empty file beside it, which goes away in the end.
+class PlanLock {
+public:
+    /// Throws Failure when another run has it. Where there are no locks, everybody gets it.
+    explicit PlanLock(const std::string& planPath);
+    PlanLock(const PlanLock&) = delete;
+    PlanLock& operator=(const PlanLock&) = delete;
+    ~PlanLock();
+
+private:
+    bool Take();
+
+    const std::string path_;
+    std::optional<FileLock> lock_;
+};
+
+} // namespace movieconv
+
+#endif
