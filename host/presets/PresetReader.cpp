@@ -186,9 +186,8 @@ private:
 
     void TakeVideo(const Json& value, const std::string& pointer) {
         constexpr const char* kRate = "a bit rate such as \"1.5M\"";
-        static const std::string kFrameRate =
-            fmt::format("a frame rate from {} to {}, such as 25 or \"30000/1001\"", kLowestFrameRate,
-                        kHighestFrameRate);
+        static const std::string kFrameRate = fmt::format(
+            "a frame rate from {} to {}, such as 25 or \"30000/1001\"", kLowestFrameRate, kHighestFrameRate);
         Preferences& into = preferences_;
         TakeMembers(
             value, pointer,

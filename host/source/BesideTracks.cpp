@@ -84,9 +84,8 @@ template <class Track>
 Track& BesideTracks::Add(int stream, std::unique_ptr<Track> track) {
     streams_.push_back(stream);
     demuxer_.ReadBeside(streams_);
-    Track& made = *track;
     tracks_.push_back(std::move(track));
-    return made;
+    return static_cast<Track&>(*tracks_.back());
 }
 
 const AVStream& BesideTracks::StreamOf(int stream) const {
