@@ -27,6 +27,18 @@ TEST(Queue, AddsFilesAndFoldersAndLooksAtThem) {
     EXPECT_EQ(bench.complaints.size(), 1);
 }
 
+TEST(Queue, TakesMoreWhileAMovieDoesNotOpen) {
+    Bench bench;
+    bench.runner.looking.Shut();
+    bench.queue.Add({bench.Movie("hangs.mkv")});
+    ASSERT_TRUE(Await([&] { return bench.queue.Entries().size() == 1; }));
+    bench.runner.looking.AwaitHeld();
+    bench.queue.Add({bench.Movie("b.mkv")});
+    EXPECT_TRUE(Await([&] { return bench.queue.Entries().size() == 2; }));
+    bench.runner.looking.Open();
+    bench.AwaitExamined();
+}
+
 TEST(Queue, GivesEveryEntryATargetOfItsOwn) {
     Bench bench;
     WriteFile(bench.folder / "a.mp4", "movie");

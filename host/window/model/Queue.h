@@ -142,8 +142,9 @@ private:
     bool keepAfter_ = false; // these three: when the batch ends
     bool tellAfter_ = false;
     QList<quint64> examineAfter_;
-    Inbox inbox_;   // of the worker's results
-    Worker worker_; // last: its tasks refer to the rest
+    Inbox inbox_;   // of the workers' results
+    Worker finder_; // searches what is added: a movie that does not open holds up none of it
+    Worker worker_; // looks at movies; both last: their tasks refer to the rest
 };
 
 } // namespace movieconv::window
