@@ -252,7 +252,7 @@ TEST(ResultTest, LaterConversionsBeginAtTheStartOfTables) {
             EXPECT_EQ(ResultOf(handle).nCategory, MC_RESULT_DONE) << ResultOf(handle).szWhat;
             const recorder::Recording recording = recorder::Recorded();
             ASSERT_EQ(recording.pictures.size(), 10U);
-            EXPECT_EQ(recording.pictures.front().llTime, 0);
+            EXPECT_EQ(int64_t{recording.pictures.front().llTime}, 0); // a packed record
             EXPECT_EQ(source.seeks, seeks);
         }
         MCDestroy(handle);

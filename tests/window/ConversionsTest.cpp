@@ -42,7 +42,7 @@ struct ConversionsTest : testing::Test {
 } // namespace
 
 TEST_F(ConversionsTest, ConvertsSeveralAtOnceAndStopsThem) {
-    const std::string movie = Holiday(10);
+    const std::string movie = Holiday(10, "640x360");
     queue.SetNaming({QStringLiteral("{name}"), folder.Path()});
     queue.Add(std::vector<std::string>(8, movie));
     dispatcher.SetAtOnce(8);

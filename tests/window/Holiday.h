@@ -6,11 +6,11 @@
 
 #include <string>
 
-/// Pictures in motion, at most ten seconds of them, with sound.
-inline std::string Holiday(int seconds = 4) {
+/// Pictures in motion, at most ten seconds of them, with sound. What only has to take its time can be small.
+inline std::string Holiday(int seconds = 4, const std::string& size = "1280x720") {
     const std::string pictures =
-        "mandelbrot=s=1280x720:r=25:start_scale=0.6:end_scale=0.01:end_pts=250,format=yuv420p";
-    return test_movies::Make("window-" + std::to_string(seconds) + "s.mkv",
+        "mandelbrot=s=" + size + ":r=25:start_scale=0.6:end_scale=0.01:end_pts=250,format=yuv420p";
+    return test_movies::Make("window-" + size + "-" + std::to_string(seconds) + "s.mkv",
                              {"-f", "lavfi", "-i", pictures, "-f", "lavfi", "-i", "sine=440:r=48000", "-t",
                               std::to_string(seconds), "-c:v", "libx264", "-preset", "veryfast", "-c:a",
                               "aac"});

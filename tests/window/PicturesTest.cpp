@@ -65,8 +65,8 @@ TEST_F(PicturesTest, ConvertsMoviesWithALivePicture) {
     const bool forPeople = qEnvironmentVariableIsSet("MOVIECONV_PICTURES");
     std::vector<std::string> movies;
     for (const char* name : {"Beach.mkv", "Mountains at dawn.mkv", "Grandma’s birthday.mkv", "Harbour.mkv"}) {
-        // Long enough for the time that is left to be foretold.
-        std::filesystem::copy_file(Holiday(forPeople && movies.empty() ? 10 : 4), folder / name);
+        // The first one long enough for the time that is left to be foretold.
+        std::filesystem::copy_file(Holiday(!movies.empty() ? 1 : forPeople ? 10 : 4), folder / name);
         movies.push_back(folder / name);
     }
     WriteFile(folder / "Packing list.mkv", "Socks");
@@ -138,7 +138,7 @@ void ConvertUntilKilled(const std::string& folder) {
 TEST_F(PicturesTest, ComesBackAfterAKill) {
     if (const char* killed = std::getenv(kKilled))
         return ConvertUntilKilled(killed);
-    std::filesystem::copy_file(Holiday(10), folder / "movie.mkv");
+    std::filesystem::copy_file(Holiday(10, "640x360"), folder / "movie.mkv");
     setenv(kKilled, folder.Path().c_str(), 1);
     const pid_t child = fork();
     if (child == 0) {
