@@ -386,7 +386,7 @@ void Course::WarnOfOlderClips() {
     const auto count = std::distance(first, clips.end());
     if (count > 0)
         observer_.Warned(
-            {Warning::Kind::kLeftover,
+            {Warning::Kind::kOlderClips,
              count == 1
                  ? fmt::format("\"{}\" of an earlier conversion stays beside the new clips", first->second)
                  : fmt::format("\"{}\" to \"{}\" of an earlier conversion stay beside the new clips",

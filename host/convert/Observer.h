@@ -73,6 +73,7 @@ struct Warning {
         kChosen,       ///< What was chosen for Request::maxSize or Request::detectCrop.
         kFailed,       ///< One of many movies failed; the others go on.
         kLeftover,     ///< Something of a run that broke off stays, for another one to go on with.
+        kOlderClips,   ///< Clips of an earlier conversion stay beside the new ones.
         kSource,       ///< Something was wrong with the source and has been put right or skipped.
     };
     Kind kind;

@@ -245,6 +245,7 @@ TEST(Job, TellsClipsOfAnotherDivisionThatStay) {
         ASSERT_EQ(listener.warnings.size(), left > 0 ? 1u : 0u);
         if (left == 0)
             continue;
+        EXPECT_EQ(listener.warnings[0].kind, Warning::Kind::kOlderClips); // which nobody can go on with
         const std::string last = '"' + (folder / "movie_03.mkv") + "\" of an earlier conversion stay";
         EXPECT_EQ(listener.warnings[0].text.find(
                       left == 1 ? last : '"' + (folder / "movie_02.mkv") + "\" to " + last),
