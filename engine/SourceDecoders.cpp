@@ -53,7 +53,7 @@ std::unique_ptr<SourceVideo> SourceVideo::Make(const MCVideoSource* table) {
 
 // Reads the next picture.
 bool SourceVideo::Load() {
-    if (isBehind && source.pfnSeek)
+    if (isBehind)
         Seek(0.0, 0);
     const VideoFormat& format = info.format;
     const double rate = format.dFrameRate;
@@ -123,7 +123,7 @@ std::unique_ptr<SourceAudio> SourceAudio::Make(const MCAudioSource* table) {
 
 // Reads the next block.
 bool SourceAudio::Load() {
-    if (isBehind && source.pfnSeek)
+    if (isBehind)
         Seek(0.0);
     const AudioFormat& format = info.format;
     block = {};

@@ -23,10 +23,11 @@ public:
     /// Belongs to a converter from now on: its book is told of errors, and the table of the end.
     void JoinConverter(ResultBook& book) { results = &book; }
 
-    /// Another conversion begins, on the thread that reads: what an earlier one left off is not its start.
+    /// Another conversion begins, on the thread that reads: where an earlier one left off is not its start. A
+    /// source that cannot be sought goes on there all the same.
     void BeginConversion() {
         ended = false;
-        isBehind = count > 0;
+        isBehind = count > 0 && source.pfnSeek;
     }
 
 protected:
@@ -43,7 +44,7 @@ protected:
 
     const Table source;
     bool ended = false;
-    bool isBehind = false; // stands where an earlier conversion ended, and was not sought since
+    bool isBehind = false; // stands where an earlier conversion ended, and is to be sought
     int64_t count = 0;     // records given
 
 private:

@@ -338,11 +338,8 @@ void Course::ReportProgress() {
     const bool changed = phase != toldPhase_;
     if (!changed && now - toldAt_ < kShortestInterval)
         return;
-    if (changed && phase == Phase::kWaitingForRoom) {
-        observer_.Warned({Warning::Kind::kWaitsForRoom,
-                          fmt::format("no space is left for \"{}\"; waiting until there is room for {}",
-                                      request_.output, FormatBytes(watch_.WaitsForRoom()))});
-    }
+    if (changed && phase == Phase::kWaitingForRoom)
+        observer_.Warned(WaitsForRoom(request_.output, watch_.WaitsForRoom()));
     toldPhase_ = phase;
     toldAt_ = now;
     Progress report = Figures();

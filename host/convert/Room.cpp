@@ -1,5 +1,6 @@
 #include "host/convert/Room.h"
 
+#include "host/convert/Amounts.h"
 #include "host/convert/CodecPlan.h"
 #include "host/convert/EncodePlan.h"
 #include "host/convert/Engine.h"
@@ -18,6 +19,12 @@ int64_t FreeBytes(const std::string& folder) {
     if (statvfs(folder.c_str(), &status) != 0 || status.f_blocks == 0)
         return -1;
     return static_cast<int64_t>(status.f_bavail) * static_cast<int64_t>(status.f_frsize);
+}
+
+Warning WaitsForRoom(const std::string& output, int64_t bytes) {
+    return {Warning::Kind::kWaitsForRoom,
+            fmt::format("no space is left for \"{}\"; waiting until there is room for {}", output,
+                        FormatBytes(bytes))};
 }
 
 Room EstimateRoom(const Request& request) {

@@ -2,6 +2,7 @@
 #ifndef MOVIECONV_HOST_CONVERT_ROOM_H
 #define MOVIECONV_HOST_CONVERT_ROOM_H
 
+#include "host/convert/Observer.h"
 #include "host/convert/Request.h"
 
 #include <cstdint>
@@ -18,6 +19,9 @@ struct Room {
     std::string folder; ///< The output's.
     int64_t free;       ///< Bytes free there; -1 when it cannot be told.
 };
+
+/// What is told when the disk is full and the conversion waits for so many bytes of room.
+Warning WaitsForRoom(const std::string& output, int64_t bytes);
 
 /// Opens the source and reckons; the output need not be possible. Throws Failure.
 Room EstimateRoom(const Request& request);

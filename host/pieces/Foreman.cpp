@@ -3,6 +3,7 @@
 #include "host/convert/Amounts.h"
 #include "host/convert/Failure.h"
 #include "host/convert/OutputCheck.h"
+#include "host/convert/Room.h"
 #include "host/pieces/PieceFile.h"
 #include "host/pieces/WholeFile.h"
 #include "host/source/MediaTime.h"
@@ -355,9 +356,7 @@ bool Foreman::FollowJoining(const Joining& latest) {
     if (joining_ && waits == waited && WorkClock::Now() - toldAt_ < kShortest)
         return true;
     if (waits && !waited)
-        News().Warned({Warning::Kind::kWaitsForRoom,
-                       fmt::format("no space is left for \"{}\"; waiting until there is room for {}",
-                                   plan_.output, FormatBytes(latest.waitsFor))});
+        News().Warned(WaitsForRoom(plan_.output, latest.waitsFor));
     joining_ = latest;
     toldAt_ = WorkClock::Now();
     Progress report;

@@ -259,6 +259,29 @@ TEST(ResultTest, LaterConversionsBeginAtTheStartOfTables) {
     }
 }
 
+// Every picture once over both, whatever of them the first one has left.
+TEST(ResultTest, LaterConversionsGoOnWithTablesThatCannotBeSought) {
+    TableSource source;
+    MCVideoSource video = source.Video();
+    video.pfnSeek = nullptr;
+    const MCHandle handle = MCCreateFromSources(&video, nullptr);
+    std::vector<int64_t> times;
+    for (const double length : {0.5, 0.0}) {
+        recorder::Reset();
+        MCStart(handle, 0.0, length, nullptr, nullptr, nullptr);
+        MCWait(handle, MC_INFINITE);
+        EXPECT_EQ(ResultOf(handle).nCategory, MC_RESULT_DONE) << ResultOf(handle).szWhat;
+        const recorder::Recording recording = recorder::Recorded();
+        for (const VideoImage& picture : recording.pictures)
+            times.push_back(int64_t{picture.llTime2}); // a packed record
+    }
+    MCDestroy(handle);
+    EXPECT_EQ(source.picture, 10);
+    ASSERT_EQ(times.size(), 10U);
+    for (std::size_t i = 0; i < times.size(); ++i)
+        EXPECT_EQ(times[i], static_cast<int64_t>(i) * 1'000'000);
+}
+
 TEST(ResultTest, RecordsOfOtherSizes) {
     TableSource source;
     const MCVideoSource video = source.Video();

@@ -145,7 +145,7 @@ TEST_F(Presets, TellWhereAndWhyTheyCannotBeUsed) {
         {"{\"video\": {\n\"speed\": \"quick\"}}", ":2: ", "slowest, slower"},
         {"{\"video\": {\n\"rate\": \"2 Mbit\"}}", ":2: ", "bit rate"},
         {"{\"video\": {\n\"fit_within\": \"720p\"}}", ":2: ", "1280x720"},
-        {"{\"video\": {\n\"frame_rate\": 240}}", ":2: ", "to 200"},
+        {"{\"video\": {\n\"frame_rate\": 240}}", ":2: ", "from 0.1 to 200"},
         {"{\"video\": {\n\"leave_out\": 1}}", ":2: ", "true or false"},
         {"{\"audio\": {\n\"rate\": {\"2\": \"160k\", \"six\": \"384k\"}}}", ":2: ", "number of channels"},
         {"{\"audio\": {\n\"channels\": 9}}", ":2: ", "1 to 8"},

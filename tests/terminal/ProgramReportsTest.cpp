@@ -105,7 +105,7 @@ TEST(Program, RefusesAndLeavesEverythingAsItWas) {
         {{"none.mkv", folder / "out.webm", "--video-codec", "XVID"}, 2, "cannot carry pictures as \"XVID\""},
         {{source, folder / "out.mp4", "--video-codec", "H.264"}, 2, "four characters"},
         {{source, folder / "out.mp4", "--no-video", "--no-audio"}, 2, "--no-audio"},
-        {{source, folder / "out.mp4", "--frame-rate", "240"}, 2, "to 200"},
+        {{source, folder / "out.mp4", "--frame-rate", "240"}, 2, "from 0.1 to 200"},
         {{source, folder / "out.mp4", "--quality", "best"}, 2, "\"best\" is not a number such as 23"},
         {{source, folder / "out.mp4", "--channels", "9"}, 2, "\"9\" is not a whole number from 1 to 8"},
         {{"--piece", "x", source}, 2, "\"x\" is not a whole number from 0 to 10000"},
