@@ -16,6 +16,7 @@ struct OptionEntry {
     std::string longName;  ///< "format".
     Value value = Value::kNone;
     std::vector<std::string> choices; ///< Of kChoice.
+    bool repeatable = false;          ///< Each mention of it adds to the others.
     std::string help;                 ///< One line.
 };
 

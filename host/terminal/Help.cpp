@@ -102,6 +102,7 @@ std::vector<OptionEntry> OptionEntries(const CLI::App& app) {
         entry.shortName = option->get_snames().empty() ? "" : option->get_snames().front();
         entry.help = option->get_description();
         std::replace(entry.help.begin(), entry.help.end(), '\n', ' ');
+        entry.repeatable = option->get_multi_option_policy() == CLI::MultiOptionPolicy::TakeAll;
         DescribeValue(*option, entry);
         entries.push_back(std::move(entry));
     }
