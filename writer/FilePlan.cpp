@@ -43,7 +43,7 @@ bool SameRate(double one, double other) {
 AVRational TakenRate(const PictureCodec& codec, double rate) {
     const AVRational* own = codec.rates;
     if (own == nullptr)
-        return av::ExactRate(rate);
+        return av::ExactRate(codec.maxRate > 0 ? std::min(rate, codec.maxRate) : rate);
     while (own[1].num != 0 && !SameRate(rate, av_q2d(*own)) && av_q2d(*own) < rate)
         ++own;
     return *own;
@@ -110,6 +110,10 @@ PictureSettings MakePictureSettings(const EncodeParam& param, const VideoFormat&
                                                       " cannot be written; choose another size.");
     const double rate =
         FirstPositive(UsableRate(param.dFrameRate), UsableRate(source.dFrameRate), kDefaultFrameRate);
+    if (options.bSteadyRate != 0 && codec.maxRate > 0 && rate > codec.maxRate)
+        throw WriterFailure(kWriterErrorArgument, "\"" + CodeText(codec.code) + "\" shows at most " +
+                                                      std::to_string(std::lround(codec.maxRate)) +
+                                                      " pictures a second.");
     settings.rate = options.bSteadyRate != 0 ? av::ExactRate(rate) : TakenRate(codec, rate);
     settings.bitrate = FirstPositive(param.nVideoBitrate, kUsualVideoBitrate, 0);
     settings.maxBitrate = param.nVideoRateMode != 0 ? std::max(0, param.nVideoMaxBitrate) : 0;
@@ -281,8 +285,9 @@ int64_t IndexSize(const FilePlan& plan, const VideoFormat* video, const AudioFor
 
 int64_t PicturePlan::StayOf(const VideoImage& image) const {
     const int64_t told = image.nDuration;
-    if (!keepStamps) // on the grid a shorter one might not be seen at all
-        return std::max(pictureLength, told);
+    if (!keepStamps && told > 0) // on the grid a shorter one might not be seen at all
+        return std::max<int64_t>(told,
+                                 std::llround(static_cast<double>(kTicksPerSecond) / av_q2d(settings.rate)));
     const bool countsPictures = clock.ticksPerPicture == 1; // and is made longer only where that pays
     return told <= 0 || (countsPictures && told - pictureLength <= kTicksPerSecond) ? pictureLength : told;
 }

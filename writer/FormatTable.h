@@ -56,6 +56,7 @@ struct PictureCodec {
     int longest = 0; ///< Seconds that a picture can be shown before it has to be there again; 0: any time.
     const AVRational* rates = nullptr; ///< All that every player knows, rising, ended by 0; null: any rate.
     bool isBt601 = false; ///< Decoders know but the matrix of BT.601, whatever a container tells.
+    double maxRate = 0;   ///< Most pictures a second that players show in time; 0: no limit.
 };
 
 /// A codec for sound.
@@ -94,12 +95,13 @@ enum class ContainerKind {
 
 /// What a container does in a way of its own.
 enum ContainerWays : uint32_t {
-    kTagsInStream = 1, ///< Texts about the movie belong to its stream.
-    kOneComment = 2,   ///< The comment and the description are one text.
-    kLanguageTags = 4, ///< Languages can have a region or a script.
-    kShortTags = 8,    ///< A text about the movie has 65535 bytes at most.
-    kTinyTags = 16,    ///< It has 255 bytes at most.
-    kTrackTexts = 32   ///< Any text about a track is written.
+    kTagsInStream = 1,  ///< Texts about the movie belong to its stream.
+    kOneComment = 2,    ///< The comment and the description are one text.
+    kLanguageTags = 4,  ///< Languages can have a region or a script.
+    kShortTags = 8,     ///< A text about the movie has 65535 bytes at most.
+    kTinyTags = 16,     ///< It has 255 bytes at most.
+    kTrackTexts = 32,   ///< Any text about a track is written.
+    kCountsSamples = 64 ///< Sound has no times: packets are heard one behind the other.
 };
 
 /// A file format.

@@ -1,5 +1,6 @@
 #include "writer/PacketTracks.h"
 
+#include "media/FourCC.h"
 #include "media/MediaRecords.h"
 #include "platform/LogRoute.h"
 #include "writer/CueRow.h"
@@ -13,6 +14,7 @@ extern "C" {
 #include <algorithm>
 #include <array>
 #include <cerrno>
+#include <cmath>
 #include <cstdlib>
 #include <cstring>
 #include <limits>
@@ -131,6 +133,7 @@ class CopiedSound final : public PacketTrack {
 public:
     CopiedSound(const Track& track, const Container& container, bool isFirst)
         : PacketTrack(track, {1, std::max(track.parameters->sample_rate, 1)}),
+          container_(container),
           carriage_(FindCarriage(container, track.parameters->codec_id)) {
         av::CheckMemory(avcodec_parameters_copy(parameters_.get(), track.parameters.get()));
         if (!isFirst)
@@ -155,6 +158,10 @@ public:
         const av::Packet packet = av::CopyOf(*item.pPacket);
         const int64_t begin = av_rescale_q(time, kTick, unit_);
         const bool follows = end_ && std::abs(begin - *end_) <= kRounding;
+        if ((container_.ways & kCountsSamples) != 0)
+            RequireNoGap(begin);
+        if (container_.code == FourCC("MP3 "))
+            KeepFromUnderflow(*packet);
         packet->pts = packet->dts =
             follows ? *end_ : std::max<int64_t>(begin, -int64_t{parameters_->initial_padding});
         packet->duration = av_rescale_q(item.llDuration, kTick, unit_);
@@ -172,6 +179,29 @@ public:
 private:
     static constexpr int64_t kRounding = 2; // samples
 
+    /// Where only the number of samples tells the time, all behind a gap would be heard too early. Pictures
+    /// begin at 0.
+    void RequireNoGap(int64_t begin) const {
+        constexpr double kAudible = 0.1; // seconds
+        const bool hasPictures = container_.video.front() != 0;
+        const int64_t before = end_ ? *end_ : hasPictures ? 0 : begin;
+        const double gap = static_cast<double>(begin - before) * av_q2d(unit_);
+        if (gap > kAudible)
+            throw WriterFailure(kWriterErrorCodec, std::string(container_.name) +
+                                                       " cannot hold sound as it is that pauses for " +
+                                                       std::to_string(std::lround(gap * 1000)) +
+                                                       " ms; convert it.");
+    }
+
+    /// The multiplexer takes the decoder's delay off the samples to leave out that a packet tells, and
+    /// writes a great number into the header where they are fewer.
+    static void KeepFromUnderflow(AVPacket& packet) {
+        constexpr uint32_t kDecoderDelay = 528 + 1;
+        uint8_t* skipped = av_packet_get_side_data(&packet, AV_PKT_DATA_SKIP_SAMPLES, nullptr);
+        if (skipped != nullptr)
+            AV_WL32(skipped, std::max(AV_RL32(skipped), kDecoderDelay));
+    }
+
     /// Its header tells it as well.
     void TellRunUp() {
         constexpr int kField = 10;
@@ -182,9 +212,10 @@ private:
                         av_rescale(parameters_->initial_padding, kRate, parameters_->sample_rate)));
     }
 
+    const Container& container_;
     const Carriage& carriage_;
-    std::optional<int64_t> first_; // where the first packet begins
-    std::optional<int64_t> end_;   // of the last one
+    std::optional<int64_t> first_;        // where the first packet begins
+    std::optional<int64_t> end_;          // of the last one
 };
 
 struct SubtitleFree {

@@ -20,11 +20,16 @@ constexpr int64_t kGridTolerance = 2 * kTicksPerSecond / 1000;
 } // namespace
 
 PictureClock MakePictureClock(AVRational rate, bool wholePictures) {
-    if (wholePictures)
-        return {rate, av_inv_q(rate), 1};
+    int factor = 1;
+    if (wholePictures) {
+        // Pictures that come seldom need not come steadily, as those of a slide show.
+        constexpr double kFewest = 10;
+        while (av_q2d(rate) * factor < kFewest)
+            factor *= 2;
+        return {rate, {rate.den, rate.num * factor}, factor};
+    }
     // As fine as the usual clocks of files: a hundred microseconds or better.
     constexpr int kFinest = 10000;
-    int factor = 1;
     while (rate.num * factor < kFinest)
         factor *= 2;
     return {rate, {1, rate.num * factor}, rate.den * factor};

@@ -19,7 +19,8 @@ struct PictureClock {
     int ticksPerPicture; ///< Ticks in one picture at the rate.
 };
 
-/// Ticks fine enough for single stamps, or whole pictures where the container knows nothing else.
+/// Ticks fine enough for single stamps; or whole pictures where the container knows nothing else, or parts
+/// of one where there are few in a second.
 PictureClock MakePictureClock(AVRational rate, bool wholePictures);
 
 /// Turns the times of pictures into ticks. Not thread-safe.

@@ -90,7 +90,8 @@ std::vector<Tag> TextsOf(const StreamInfo& stream, const Request& request) {
 /// The stream's language by a code that the format can hold; empty when there is none.
 std::string LanguageIn(const FileFormatInfo& format, const StreamInfo& stream) {
     // Transport streams tell the language of sound and subtitles only.
-    const bool hasNone = stream.kind == StreamKind::kPictures && format.fccFormat == FourCC("TS  ");
+    const bool hasNone = stream.kind == StreamKind::kPictures &&
+                         (format.fccFormat == FourCC("TS  ") || format.fccFormat == FourCC("M2TS"));
     if (stream.language.empty() || hasNone)
         return {};
     for (const std::string& code : CodesFor(stream.language))

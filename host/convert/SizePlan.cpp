@@ -95,7 +95,7 @@ Request FitIntoSize(Request request, const SourceInfo& source) {
     const bool sound = source.sound && format.bHasAudio != 0;
     if (pictures && IsAmong(ChooseVideoCodec(request, format).value_or(0), {FourCC("FFV1"), FourCC("GIF ")}))
         throw Failure(Category::kRequest, "a codec without a bit rate cannot keep below a size");
-    const bool packets = IsAmong(format.fccFormat, {FourCC("TS  "), FourCC("MPG ")});
+    const bool packets = IsAmong(format.fccFormat, {FourCC("TS  "), FourCC("M2TS"), FourCC("MPG ")});
     const auto tracks = static_cast<double>(1 + CarryPlan(source, request, format).FurtherSound().size());
     const double packetRate = (pictures ? source.pictures->peakRate : 0) +
                               (sound ? tracks * source.sound->sampleRate / kSamplesPerPacket : 0);

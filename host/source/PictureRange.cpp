@@ -23,7 +23,7 @@ PictureRange::Place PictureRange::Fit(StampRepair::Stamp& stamp) const {
 }
 
 StampRepair::Stamp TakeOffOne(StampRepair::Stamp& stay) {
-    constexpr int64_t kLongest = 200 * kTicksPerSecond;
+    constexpr int64_t kLongest = 100 * kTicksPerSecond; // two of them are within the engine's 214 s
     constexpr int64_t kCredible = int64_t{24} * 3600 * kTicksPerSecond; // more is a fault of the stamps
     const StampRepair::Stamp one{stay.time, std::min(stay.duration, kLongest)};
     stay = stay.duration > kCredible

@@ -56,7 +56,7 @@ TEST(Formats, AreFoundByCodeExtensionAndName) {
     } names[] = {{"mp4", FourCC("MP4 ")},
                  {"MP4", FourCC("MP4 ")},
                  {"mkv", FourCC("MKV ")},
-                 {"m2ts", FourCC("TS  ")},
+                 {"m2ts", FourCC("M2TS")},
                  {"xyz", 0},
                  {"", 0},
                  {"mp4 movie", 0}};

@@ -129,7 +129,8 @@ TEST_F(Extras, AreInEachFormatAsFarAsItCarriesThem) {
         const uint32_t traits = MWGetFormatTraits(format->fccFormat);
         const ReadExtras read = ReadExtrasOf(path_);
         const bool hasTags = (traits & kWriterFormatTags) != 0;
-        const bool isTransport = format->fccFormat == FourCC("TS  "); // knows nothing but a service's name
+        const bool isTransport = (format->fccFormat == FourCC("TS  ") ||
+                                  format->fccFormat == FourCC("M2TS")); // knows nothing but a service's name
         const auto title = read.tags.find(isTransport ? "service_name" : "title");
         EXPECT_EQ(title != read.tags.end() && title->second == "Fußweg & \"Brücke\"", hasTags);
         EXPECT_EQ(read.tags.count("comment"), 0U);
