@@ -80,7 +80,7 @@ Course::Course(const Request& request, Movie& movie, Wishes& wishes, Observer& o
     if (request.piece && request.piece->pictures)
         movie.EndPicturesAt(ToSeconds(request.piece->until));
     else if (request.length)
-        movie.EndPicturesAt(request.begin + length_);
+        movie.EndPicturesAt(request.begin + *request.length);
     if (movie.Info().pictures)
         wishes.pictures.Expect(*movie.Info().pictures, movie.KeepsHdr());
 }
@@ -119,7 +119,7 @@ Verdict Course::Run() {
 
 /// A clip that is not the movie's first.
 void Course::RunClip() {
-    RunEngine(0, request_.length ? std::max(length_ - clips_.Offset(), kLeastLength) : 0);
+    RunEngine(0, request_.length ? std::max(*request_.length - clips_.Offset(), kLeastLength) : 0);
 }
 
 /// One file: all of an output that is not split.
@@ -298,7 +298,7 @@ double Course::Position() const {
 /// Seconds converted when the movie is at `position`. A picture can reach beyond the length that was asked
 /// for, and a movie beyond the one it announces.
 double Course::Converted(double position) const {
-    return std::clamp(position, 0.0, request_.length ? length_ : std::numeric_limits<double>::max());
+    return std::clamp(position, 0.0, request_.length.value_or(std::numeric_limits<double>::max()));
 }
 
 /// While the rest of the sound is converted after the last picture, only the sound tells how far it is.
@@ -395,7 +395,7 @@ void Course::WarnOfOlderClips() {
 std::string Course::WhyItEndedEarly() const {
     const std::optional<Shortfall> missing = movie_.Missing();
     const double converted = std::max(Position(), movie_.SoundSeconds());
-    const bool lengthReached = request_.length && length_ - converted <= kEarlyEnd;
+    const bool lengthReached = request_.length && *request_.length - converted <= kEarlyEnd;
     if (!missing || lengthReached || outcome_ != kOutcomeCompleted)
         return {};
     if (HasShrunk(movie_.Info()))

@@ -100,9 +100,12 @@ const AVCodecParameters& CopiedSound::Describe() {
     return *parameters_;
 }
 
-/// The samples of the first packets that a decoder leaves out.
+/// The samples of the first packets that a decoder leaves out: what the codec needs, not what an edit list
+/// cuts off, of which a packet before the cut is enough.
 int64_t CopiedSound::RunUp(const AVPacket& first) const {
-    constexpr int64_t kMost = 1 << 16;
+    constexpr int64_t kMostFrames = 4;
+    const int64_t frame = parameters_->frame_size;
+    const int64_t most = frame > 0 ? kMostFrames * frame : int64_t{parameters_->sample_rate} / 10;
     size_t size = 0;
     const uint8_t* skipped = av_packet_get_side_data(&first, AV_PKT_DATA_SKIP_SAMPLES, &size);
     int64_t samples = skipped != nullptr && size >= 4 ? int64_t{AV_RL32(skipped)} : 0;
@@ -110,7 +113,9 @@ int64_t CopiedSound::RunUp(const AVPacket& first) const {
         first.pts != AV_NOPTS_VALUE ? -SamplesAt(reader_.MediaTime(first.pts, timeBase_)) : 0;
     if (samples == 0)
         samples = parameters_->initial_padding > 0 ? parameters_->initial_padding : early;
-    return samples > 0 && samples <= kMost ? samples : 0;
+    if (samples > most)
+        return frame > 0 ? samples % frame + frame : 0;
+    return std::max<int64_t>(samples, 0);
 }
 
 bool CopiedSound::Find(int64_t until, bool closing, Item& item) {

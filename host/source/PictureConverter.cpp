@@ -157,8 +157,11 @@ PictureConverter::Size PictureConverter::StoredSize(const PictureStreamInfo& str
 }
 
 /// By how much wider the picture's pixels are than those of the stream; 1 when nearly the same. The container
-/// may tell another shape than the pictures do, but for all of them.
+/// may tell another shape than the pictures do, but for all of them, and a picture that tells none has the
+/// stream's.
 double PictureConverter::Widening(const AVFrame& picture) const {
+    if (picture.sample_aspect_ratio.num <= 0)
+        return 1;
     const auto shape = [](AVRational aspect) {
         return aspect.num > 0 && aspect.den > 0 ? av_q2d(aspect) : 1;
     };

@@ -89,9 +89,9 @@ void FindPromise(const MovieReader& reader, const Length& length, SourceInfo& in
     const auto announced = [&](const auto& stream) -> std::optional<double> {
         if (!stream || oneLength)
             return std::nullopt;
-        const double end = stream->duration > 0
-                               ? stream->duration
-                               : TaggedEnd(context.streams[stream->index], ToSeconds(reader.Start()));
+        // A stream that begins far behind the others is given the length of the file otherwise.
+        const double tagged = TaggedEnd(context.streams[stream->index], ToSeconds(reader.Start()));
+        const double end = tagged > 0 ? tagged : stream->duration;
         return end > 0 && end < length.seconds + 1 ? std::optional(end) : std::nullopt;
     };
     promise.pictures = announced(info.pictures);
@@ -159,7 +159,7 @@ void ProbeLength(MovieReader& reader, SourceInfo& info) {
     FindPromise(reader, length, info);
     info.duration = 0;
     const auto complete = [&](double& duration, std::optional<double> promised) {
-        if (duration <= 0 || !length.announced)
+        if (duration <= 0 || !length.announced || promised.value_or(duration) < duration)
             duration = promised.value_or(length.seconds);
         info.duration = std::max(info.duration, duration);
     };

@@ -231,7 +231,55 @@ TEST(CopiedSound, OfSeveralTracksIsCarriedAsFarAsTheFormatHoldsIt) {
     EXPECT_EQ(ContentsOf(PacketsOf(folder / "pieces.mkv")), ContentsOf(PacketsOf(source)));
 }
 
-// A recording that was cut begins amid a frame, of which nothing can be heard.
+// Where packets have no times, all that follows would be heard too early.
+TEST(CopiedSound, ThatPausesIsRefusedWhereOnlySamplesAreCounted) {
+    const Args dropped = Words("-bsf:a noise=drop=gte(n\\,40)*lt(n\\,70)");
+    const auto pausing = [&](const std::string& name, const std::string& codec) {
+        return Make(name, Join(Join(CountedPictures(4), Beeps(4)), Join(Words("-c:a " + codec), dropped)));
+    };
+    const std::string late =
+        Make("late-track.mkv",
+             Join(Join(CountedPictures(4), Beeps(4)),
+                  Join(Args{"-itsoffset", "1.5"}, Join(Beeps(2), Words("-map 0 -map 1 -map 2 -c:a ac3")))));
+    const std::string ac3 = pausing("pause-ac3.mkv", "ac3");
+    const struct {
+        std::string source;
+        const char* format;
+        int code;
+    } cases[] = {{ac3, "mkv", 0},
+                 {ac3, "mp4", 0},
+                 {ac3, "avi", 2},
+                 {pausing("pause-mp3.mkv", "libmp3lame"), "mp3", 2},
+                 {pausing("pause-pcm.mkv", "pcm_s16le"), "wav", 2},
+                 {late, "mkv", 0},
+                 {late, "avi", 2}};
+    const Folder folder;
+    for (const auto& test : cases) {
+        const Result made = Call(
+            {"-q", "-y", "--audio-codec", "copy", test.source, folder / (std::string("out.") + test.format)});
+        EXPECT_EQ(made.code, test.code) << test.source << test.format << made.err;
+        EXPECT_EQ(Has(made.err, "that pauses for"), test.code != 0) << made.err;
+    }
+}
+
+TEST(CopiedSound, IsHeardAsMuchAsPicturesAreSeen) {
+    const Folder folder;
+    constexpr double kBytes = 48000 * 4; // a second
+    // Nothing at the begin is taken for what a decoder leaves out.
+    ASSERT_EQ(Call({"-q", "--audio-codec", "copy", "--begin", "1",
+                    WithSound("copied_mp3.mp4", "-c:a libmp3lame"), folder / "out.mp3"})
+                  .code,
+              0);
+    EXPECT_NEAR(static_cast<double>(SoundOf(folder / "out.mp3").size()) / kBytes, 2, 0.05);
+    // What an edit list cuts off is left out.
+    const std::string cut =
+        Make("copied_cut.mp4", {"-ss", "1.3", "-i", WithSound("copied_aac.mp4", "-c:a aac"), "-c", "copy"});
+    for (const char* name : {"out.mkv", "out.mp4"}) {
+        ASSERT_EQ(Call({"-q", "--audio-codec", "copy", cut, folder / name}).code, 0);
+        EXPECT_NEAR(static_cast<double>(SoundOf(folder / name).size()) / kBytes, 1.7, 0.07) << name;
+    }
+}
+
 // What follows would be described wrongly.
 TEST(CopiedSound, EndsWhereItsFormChanges) {
     const Folder folder;
@@ -274,6 +322,7 @@ TEST(CopiedSound, KeepsFramesThatTellTheirFormButForAnotherRate) {
     }
 }
 
+// A recording that was cut begins amid a frame, of which nothing can be heard.
 TEST(CopiedSound, LeavesTheRestOfACutFrameOut) {
     const Folder folder;
     const std::string whole =

@@ -143,6 +143,19 @@ const Odd kOddities[] = {
 };
 INSTANTIATE_TEST_SUITE_P(Sources, ProgramTakes, testing::ValuesIn(kOddities));
 
+// Discs and camcorders have a stamp before each packet of a transport stream.
+TEST(Program, WritesTransportStreamsOfBothKinds) {
+    const std::string source = Make("short.mkv", Join(CountedPictures(1), Beeps(1)));
+    const Folder folder;
+    for (const auto& [name, sync, packet] : {std::tuple{"a.ts", 0U, 188U}, {"a.m2ts", 4U, 192U}}) {
+        ASSERT_EQ(Call({"-q", source, folder / name}).code, 0) << name;
+        const std::string written = ReadFile(folder / name);
+        EXPECT_EQ(written.size() % packet, 0U) << name;
+        EXPECT_EQ(written.at(sync), 'G') << name;
+        EXPECT_EQ(written.at(sync + packet), 'G') << name;
+    }
+}
+
 TEST(Program, TakesNamesInAnyScript) {
     const Folder folder;
     const std::string dashed = folder / "-y";

@@ -118,11 +118,17 @@ TEST(Times, OfTheLastPictureLastAsLongAsItsSourceTells) {
     const std::string slides =
         Make("slides.mkv", Join(Join(CountedPictures(4.24), NearLossless()),
                                 Join(picks, Args{"select='not(n)+eq(n,25)+eq(n,100)+eq(n,105)'"})));
+    const std::string few = // it tells how many there are in a second
+        Make("slides.mp4", Join(Join(CountedPictures(4.24), NearLossless()),
+                                Join(picks, Args{"select='not(n)+eq(n,25)+eq(n,100)+eq(n,105)'",
+                                                 "-video_track_timescale", "25"})));
     const struct {
         std::string source;
         Args options;
         double end;
     } cases[] = {
+        {few, {}, 4.24},
+        {few, {"--frame-rate", "25"}, 4.24},
         {held, {}, 3.9},
         {held, {"--frame-rate", "25"}, 3.9},
         {held, {"--begin", "0.5", "--length", "2"}, 2},
@@ -138,6 +144,8 @@ TEST(Times, OfTheLastPictureLastAsLongAsItsSourceTells) {
                 std::find(test.options.begin(), test.options.end(), "--jobs") != test.options.end();
             if (inPieces && format == std::string("gif"))
                 continue; // which is not made of any
+            if (test.source == few && test.options.empty() && format == std::string("mkv"))
+                continue; // whose reader takes a usual length for each
             SCOPED_TRACE(test.source + " " + format + " " + std::to_string(&test - cases));
             EXPECT_NEAR(EndOf(Convert(test.source, test.options, format)), test.end, 0.11);
         }
@@ -148,6 +156,42 @@ TEST(Times, OfTheLastPictureLastAsLongAsItsSourceTells) {
 }
 
 // MPEG-2 has few rates; one that nobody asked for is brought to the next one.
+TEST(Times, OfAviAreKeptWhereFewPicturesCome) {
+    const std::string source =
+        Make("seldom.mp4",
+             Join(Join(CountedPictures(20), NearLossless()),
+                  Args{"-fps_mode", "passthrough", "-vf", "select='not(n)+eq(n,60)+eq(n,330)+eq(n,405)'"}));
+    const Seen seen = Convert(source, {}, "avi");
+    std::vector<double> times; // when another picture is seen
+    for (std::size_t i = 0; i < seen.pictures.size(); ++i)
+        if (i == 0 || std::abs(seen.pictures[i].luma - seen.pictures[i - 1].luma) > 1)
+            times.push_back(seen.pictures[i].time);
+    const std::vector<double> wanted{0, 2.4, 13.2, 16.2};
+    ASSERT_EQ(times.size(), wanted.size());
+    for (std::size_t i = 0; i < wanted.size(); ++i)
+        EXPECT_NEAR(times[i], wanted[i], 0.06);
+}
+
+// Players take a picture of less than 20 ms for one of 100.
+TEST(Times, OfGifAreThoseThatPlayersKeep) {
+    const std::string source = Make("fast.mkv", Join(CountedPictures(2, "100"), NearLossless()));
+    const Seen seen = Convert(source, {}, "gif");
+    EXPECT_NEAR(EndOf(seen), 2, 0.1);
+    const Folder folder;
+    EXPECT_EQ(Call({"-q", "--frame-rate", "60", source, folder / "out.gif"}).code, 2);
+}
+
+TEST(Times, OfSilenceBehindTheSoundAreThoseOfLongPictures) {
+    const std::string source =
+        Make("stills.mkv", Join(Lavfi("testsrc2=s=64x48:r=1/250:d=1000"),
+                                Join(Lavfi("aevalsrc=0.4*sin(500*t):s=8000:d=5"), Words("-c:a pcm_s16le"))));
+    const Folder folder;
+    ASSERT_EQ(Call({"-q", source, folder / "out.mp4"}).code, 0);
+    const std::string told =
+        Ffprobe(folder / "out.mp4", Words("-select_streams a -show_entries stream=duration -of csv=p=0"));
+    EXPECT_GE(std::stod(told), 850);
+}
+
 TEST(Times, OfMpeg2AreThoseOfOneOfItsRates) {
     const std::string source =
         Make("mean-rate.mp4",

@@ -33,6 +33,25 @@ TEST(UnusualPictures, SlowMotionKeepsEveryPictureWithItsTime) {
     }
 }
 
+TEST(UnusualPictures, FillTheirFrameWhereTheContainerAloneTellsTheirShape) {
+    const Folder folder;
+    for (const auto& [codec, name] :
+         {std::pair{"prores_ks", "shape.mov"}, {"libvpx-vp9", "shape.webm"}, {"ffv1", "shape.mkv"}}) {
+        const std::string square =
+            Make(std::string("square-") + name, Join(Lavfi("color=white:s=96x72:r=25:d=0.4"),
+                                                     Args{"-c:v", codec, "-pix_fmt", "yuv422p10le"}));
+        const std::string wide = Make(name, {"-i", square, "-c", "copy", "-aspect", "16:9"});
+        ASSERT_EQ(Call({"-q", "-y", wide, folder / "out.mkv"}).code, 0);
+        const Result corner =
+            program::Run(Join(Words("ffmpeg -v error -i"), Args{folder / "out.mkv"},
+                              Words("-vframes 1 -vf crop=2:2:0:0,format=gray -f rawvideo -")));
+        ASSERT_EQ(corner.out.size(), 4U);
+        EXPECT_GT(static_cast<unsigned char>(corner.out[0]), 200) << name;
+        EXPECT_EQ(Ffprobe(folder / "out.mkv", Words("-show_entries stream=display_aspect_ratio -of csv=p=0")),
+                  "16:9\n");
+    }
+}
+
 TEST(UnusualPictures, WhatTheyLoseIsTold) {
     const struct {
         const char* name;
