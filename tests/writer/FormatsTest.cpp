@@ -143,7 +143,9 @@ TEST_P(PictureFormats, TakeAQualityOfTheCodecsScale) {
     };
     const int64_t small = size(best + 0.8 * (worst - best));
     EXPECT_GT(small, 0);
-    EXPECT_GT(size(best + 0.05 * (worst - best)), small);
+    // Few packets fill a unit of 6144 bytes there, of which such a file consists.
+    const int64_t least = format == FourCC("M2TS") ? small - 1 : small;
+    EXPECT_GT(size(best + 0.05 * (worst - best)), least);
     EXPECT_EQ(size(worst + 1), 0);
     EXPECT_EQ(size(best - 1), 0);
 }
