@@ -18,14 +18,14 @@ constexpr int32_t kCompletedAudioBitrate = 64'000;
 
 EncodeParam DefaultEncodeParam() {
     EncodeParam param{};
-    param.fccVideo = FourCC("XVID");
+    param.fccVideo = kEngineVideoCodec;
     param.fccColorFormat = FourCC("YV12");
     param.nBitCount = 12;
     param.nWidth = 320;
     param.nHeight = 240;
     param.dFrameRate = 24.0;
     param.nVideoBitrate = kUsualVideoBitrate;
-    param.fccAudio = FourCC("AAC ");
+    param.fccAudio = kEngineAudioCodec;
     param.nSampleRate = 22050;
     param.nChannels = 2;
     param.nBitsPerSample = 16;

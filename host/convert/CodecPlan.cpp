@@ -3,6 +3,7 @@
 #include "host/convert/Failure.h"
 #include "host/convert/Formats.h"
 #include "media/FourCC.h"
+#include "media/Limits.h"
 #include "writer/WriterStatus.h"
 
 #include <algorithm>
@@ -21,26 +22,24 @@ std::string NamesOf(const std::vector<uint32_t>& codes) {
     return names;
 }
 
-std::optional<uint32_t> ChooseCodec(const std::optional<uint32_t>& asked,
-                                    const std::vector<uint32_t>& preferred, const FileFormatInfo& format,
-                                    bool forSound) {
-    const std::vector<uint32_t> wanted = asked ? std::vector{*asked} : preferred;
+/// What is asked for, or the first that is preferred, or the engine's where the format carries it, or the
+/// format's first.
+uint32_t ChooseCodec(const std::optional<uint32_t>& asked, const std::vector<uint32_t>& preferred,
+                     const FileFormatInfo& format, bool forSound) {
+    std::vector<uint32_t> wanted = asked ? std::vector{*asked} : preferred;
+    const bool carriesAny = forSound ? format.bHasAudio != 0 : format.bHasVideo != 0;
+    const bool isOpen = wanted.empty() || (!asked && !carriesAny);
+    if (isOpen)
+        wanted = {forSound ? kEngineAudioCodec : kEngineVideoCodec};
     for (const uint32_t code : wanted)
         if (const uint32_t carried = MWFindCodec(format.fccFormat, code, forSound ? 1 : 0); carried != 0)
             return carried;
-    const bool carriesAny = forSound ? format.bHasAudio != 0 : format.bHasVideo != 0;
-    if (wanted.empty() || (!asked && !carriesAny))
-        return std::nullopt;
+    if (isOpen)
+        return forSound ? format.fccAudioCodecs[0] : format.fccVideoCodecs[0];
     throw Failure(Category::kRequest,
                   fmt::format("{} cannot carry {} as \"{}\"", format.szName, forSound ? "sound" : "pictures",
                               NamesOf(wanted)),
                   Reason::kCodec);
-}
-
-/// The codec that the engine takes by itself where the format carries it, or the format's first.
-uint32_t UsualVideoCodec(const FileFormatInfo& format) {
-    const uint32_t carried = MWFindCodec(format.fccFormat, FourCC("XVID"), 0);
-    return carried != 0 ? carried : format.fccVideoCodecs[0];
 }
 
 /// The source's size made smaller, in its shape, until it fits; nothing when it fits.
@@ -68,10 +67,8 @@ double GifRate(double rate) {
 }
 
 std::optional<double> PreferredQuality(const Preferences& preferences, uint32_t codec, int height) {
-    for (const uint32_t key : {codec, uint32_t{0}}) // one of no codec is for all
-        if (const auto found = preferences.quality.find(key); found != preferences.quality.end())
-            return found->second.At(height);
-    return std::nullopt;
+    const Steps<double>* qualities = QualityScaleOf(codec) ? preferences.QualitiesOf(codec) : nullptr;
+    return qualities != nullptr ? qualities->At(height) : std::nullopt;
 }
 
 /// Throws Failure when the codec has no scale or another one.
@@ -94,17 +91,13 @@ void PlanRate(PicturePlan& plan, const Request& request, int height) {
     plan.maxRate = request.videoMaxRate ? request.videoMaxRate : preferences.videoMaxRate;
     if (request.videoRate) {
         plan.rate = request.videoRate;
-    } else if (plan.codec) {
-        plan.quality = request.quality ? request.quality : PreferredQuality(preferences, *plan.codec, height);
+    } else {
+        plan.quality = request.quality ? request.quality : PreferredQuality(preferences, plan.codec, height);
         if (plan.quality)
-            RequireQuality(*plan.codec, *plan.quality);
+            RequireQuality(plan.codec, *plan.quality);
     }
     if (!plan.quality && !plan.rate)
         plan.rate = preferences.videoRate;
-}
-
-uint32_t CodecOf(const std::optional<uint32_t>& chosen, const FileFormatInfo& format) {
-    return chosen.value_or(UsualVideoCodec(format));
 }
 
 void PlanDepth(PicturePlan& plan, const Request& request, const FileFormatInfo& format,
@@ -113,11 +106,11 @@ void PlanDepth(PicturePlan& plan, const Request& request, const FileFormatInfo& 
     if (request.depth && *request.depth > most) {
         throw Failure(Category::kRequest,
                       fmt::format("\"{}\" has pictures of {} bits; HEVC, VP90 and AV01 have some of 10",
-                                  CodeName(CodecOf(plan.codec, format)), most));
+                                  CodeName(plan.codec), most));
     }
     if (request.hdr == Hdr::kKeep && IsHdr(source) && most <= 8) {
-        throw Failure(Category::kRequest, fmt::format("HDR needs pictures of 10 bits; \"{}\" has 8 here",
-                                                      CodeName(CodecOf(plan.codec, format))));
+        throw Failure(Category::kRequest,
+                      fmt::format("HDR needs pictures of 10 bits; \"{}\" has 8 here", CodeName(plan.codec)));
     }
     plan.keepsHdr = IsHdr(source) && most > 8 && request.hdr != Hdr::kSdr;
     plan.depth = request.depth.value_or(source.depth > 8 || plan.keepsHdr ? most : 8);
@@ -126,17 +119,17 @@ void PlanDepth(PicturePlan& plan, const Request& request, const FileFormatInfo& 
 } // namespace
 
 int MostDepth(const Request& request, const FileFormatInfo& format) {
-    const int codecs = MWGetPictureDepth(CodecOf(ChooseVideoCodec(request, format), format));
+    const int codecs = MWGetPictureDepth(PictureCodecFor(request, format));
     return std::clamp(request.depth.value_or(codecs), 8, std::max(codecs, 8));
 }
 
-std::optional<uint32_t> ChooseVideoCodec(const Request& request, const FileFormatInfo& format) {
+uint32_t PictureCodecFor(const Request& request, const FileFormatInfo& format) {
     return ChooseCodec(request.videoCodec, request.preferences.videoCodecs, format, false);
 }
 
-std::optional<uint32_t> ChooseAudioCodec(const Request& request, const FileFormatInfo& format) {
+uint32_t SoundCodecFor(const Request& request, const FileFormatInfo& format) {
     if (request.copySound)
-        return std::nullopt;
+        return ChooseCodec({}, {}, format, true);
     return ChooseCodec(request.audioCodec, request.preferences.audioCodecs, format, true);
 }
 
@@ -144,13 +137,11 @@ PicturePlan PlanPictures(const Request& request, const FileFormatInfo& format,
                          const PictureStreamInfo& source) {
     const Preferences& preferences = request.preferences;
     PicturePlan plan;
-    plan.codec = ChooseVideoCodec(request, format);
-    if (!plan.codec && request.quality) // which needs to know whose scale it is on
-        plan.codec = UsualVideoCodec(format);
+    plan.codec = PictureCodecFor(request, format);
     plan.size = request.size;
     if (!plan.size && preferences.fitWithin)
         plan.size = FitWithin(source, *preferences.fitWithin);
-    const bool isGif = CodecOf(plan.codec, format) == kGif;
+    const bool isGif = plan.codec == kGif;
     if (!plan.size && isGif)
         plan.size = FitWithin(source, GifSize());
     plan.frameRate = request.frameRate ? request.frameRate : preferences.frameRate;
@@ -172,16 +163,15 @@ bool HasRates(const Request& request, const FileFormatInfo& format, const Source
     if (!source.pictures || format.bHasVideo == 0)
         return true;
     const PicturePlan plan = PlanPictures(request, format, *source.pictures);
-    const bool lossless = plan.codec && !QualityScaleOf(*plan.codec);
-    return !plan.quality && !lossless;
+    return !plan.quality && QualityScaleOf(plan.codec); // what has no scale loses nothing
 }
 
 SoundPlan PlanSound(const Request& request, const FileFormatInfo& format, const SoundStreamInfo& source) {
     const Preferences& preferences = request.preferences;
     SoundPlan plan;
+    plan.codec = SoundCodecFor(request, format);
     if (request.copySound)
         return plan;
-    plan.codec = ChooseAudioCodec(request, format);
     plan.channels = request.channels ? request.channels : preferences.channels;
     if (!plan.channels && preferences.maxChannels && source.channels > *preferences.maxChannels)
         plan.channels = preferences.maxChannels;

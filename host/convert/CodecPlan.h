@@ -13,7 +13,7 @@ namespace movieconv {
 
 /// What has no value is left to the engine and the encoder.
 struct PicturePlan {
-    std::optional<uint32_t> codec;
+    uint32_t codec = 0;
     std::optional<Size> size;
     std::optional<double> frameRate;
     bool steadyRate = false;       ///< It was asked for, so that even a source of that rate is brought to it.
@@ -27,17 +27,17 @@ struct PicturePlan {
 };
 
 struct SoundPlan {
-    std::optional<uint32_t> codec;
+    uint32_t codec = 0;
     std::optional<int32_t> channels;
     std::optional<int32_t> sampleRate;
     std::optional<int32_t> rate; ///< Bits per second.
     std::optional<int32_t> maxRate;
 };
 
-/// The codec for files of `format`, whose codes are the media writer's. Nothing where the choice is open.
+/// The codec for files of `format`, whose codes are the media writer's; 0 where it carries no such track.
 /// Throws Failure when the format cannot carry what is asked for, or nothing of what is preferred.
-std::optional<uint32_t> ChooseVideoCodec(const Request& request, const FileFormatInfo& format);
-std::optional<uint32_t> ChooseAudioCodec(const Request& request, const FileFormatInfo& format);
+uint32_t PictureCodecFor(const Request& request, const FileFormatInfo& format);
+uint32_t SoundCodecFor(const Request& request, const FileFormatInfo& format);
 
 /// Most bits that a component can have in the output's pictures, 8 or 10.
 int MostDepth(const Request& request, const FileFormatInfo& format);

@@ -15,17 +15,10 @@
 namespace movieconv {
 namespace {
 
-/// The engine's usual codec if the format carries it, or the format's first.
-template <std::size_t N>
-uint32_t UsualCodec(uint32_t usual, const uint32_t (&carried)[N]) {
-    const bool carriesUsual = std::find(std::begin(carried), std::end(carried), usual) != std::end(carried);
-    return carriesUsual || carried[0] == 0 ? usual : carried[0];
-}
-
 void PutPictures(EncodeParam& param, const FileFormatInfo& format, const Request& request,
                  const PictureStreamInfo& source) {
     const PicturePlan plan = PlanPictures(request, format, source);
-    param.fccVideo = plan.codec.value_or(UsualCodec(param.fccVideo, format.fccVideoCodecs));
+    param.fccVideo = plan.codec;
     if (plan.size) {
         param.nWidth = plan.size->width;
         param.nHeight = plan.size->height;
@@ -43,7 +36,7 @@ void PutPictures(EncodeParam& param, const FileFormatInfo& format, const Request
 void PutSound(EncodeParam& param, const FileFormatInfo& format, const Request& request,
               const SoundStreamInfo& source) {
     const SoundPlan plan = PlanSound(request, format, source);
-    param.fccAudio = plan.codec.value_or(UsualCodec(param.fccAudio, format.fccAudioCodecs));
+    param.fccAudio = plan.codec;
     param.nChannels = plan.channels.value_or(param.nChannels);
     param.nSampleRate = plan.sampleRate.value_or(param.nSampleRate);
     param.nAudioBitrate = plan.rate.value_or(param.nAudioBitrate);
@@ -91,8 +84,8 @@ const FileFormatInfo& ChooseFormat(const Request& request) {
                       fmt::format("the extension of \"{}\" tells no file format", request.output),
                       Reason::kNoFormat);
     }
-    ChooseVideoCodec(request, *format);
-    ChooseAudioCodec(request, *format);
+    PictureCodecFor(request, *format);
+    SoundCodecFor(request, *format);
     return *format;
 }
 
@@ -100,12 +93,12 @@ EncodeParam PlanEncoding(const EncodeParam& defaults, const FileFormatInfo& form
                          const SourceInfo& source) {
     EncodeParam param = defaults;
     param.fccFileFormat = format.fccFormat;
-    if (source.pictures)
-        PutPictures(param, format, request, *source.pictures);
-    if (source.sound)
-        PutSound(param, format, request, *source.sound);
     param.bNoVideo = source.pictures && format.bHasVideo != 0 ? 0 : 1;
     param.bNoAudio = source.sound && format.bHasAudio != 0 ? 0 : 1;
+    if (param.bNoVideo == 0)
+        PutPictures(param, format, request, *source.pictures);
+    if (param.bNoAudio == 0)
+        PutSound(param, format, request, *source.sound);
     if (param.bNoVideo != 0 && param.bNoAudio != 0) {
         throw Failure(Category::kRequest,
                       fmt::format("{} carries nothing that \"{}\" holds; choose another format",

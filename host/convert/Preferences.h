@@ -48,6 +48,7 @@ struct Preferences {
     std::vector<uint32_t> audioCodecs;
     bool copySound = false; ///< Sound stays as it is coded, unless a request changes it.
 
+    static constexpr uint32_t kAnyCodec = 0;
     /// By codec, by the height of the picture; see Request::quality.
     std::map<uint32_t, Steps<double>> quality;
     std::optional<int32_t> videoRate; ///< Bits per second, where there is no quality.
@@ -64,6 +65,14 @@ struct Preferences {
     std::optional<int32_t> sampleRate; ///< Samples per second and channel.
     bool noVideo = false;
     bool noAudio = false;
+
+    /// Null where neither the codec has any nor all have.
+    const Steps<double>* QualitiesOf(uint32_t codec) const {
+        for (const uint32_t key : {codec, kAnyCodec})
+            if (const auto found = quality.find(key); found != quality.end())
+                return &found->second;
+        return nullptr;
+    }
 };
 
 } // namespace movieconv

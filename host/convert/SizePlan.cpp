@@ -5,6 +5,7 @@
 #include "host/convert/CodecPlan.h"
 #include "host/convert/EncodePlan.h"
 #include "host/convert/Failure.h"
+#include "host/convert/Formats.h"
 #include "media/FourCC.h"
 #include "media/Limits.h"
 
@@ -45,8 +46,7 @@ double LeastBitsPerPixel(uint32_t codec) {
 double FitSound(Request& request, const FileFormatInfo& format, const SoundStreamInfo& source, double share) {
     SoundPlan plan = PlanSound(request, format, source);
     const double sampleRate = plan.sampleRate.value_or(source.sampleRate);
-    if (IsAmong(plan.codec.value_or(format.fccAudioCodecs[0]),
-                {FourCC("PCM "), FourCC("FLAC"), FourCC("ALAC")}))
+    if (IsAmong(plan.codec, {FourCC("PCM "), FourCC("FLAC"), FourCC("ALAC")}))
         return sampleRate * plan.channels.value_or(source.channels) * source.bitsPerSample;
     const double least = kLeastSoundBits * sampleRate;
     if (!request.channels && share < least * plan.channels.value_or(source.channels)) {
@@ -70,7 +70,7 @@ void FitPictures(Request& request, const FileFormatInfo& format, const PictureSt
     const Size size = plan.size.value_or(Size{source.width, source.height});
     const double pixels =
         static_cast<double>(size.width) * size.height * plan.frameRate.value_or(source.frameRate);
-    const double factor = std::sqrt(rate / std::max(pixels, 1.0) / LeastBitsPerPixel(plan.codec.value_or(0)));
+    const double factor = std::sqrt(rate / std::max(pixels, 1.0) / LeastBitsPerPixel(plan.codec));
     if (factor >= 1)
         return;
     static constexpr int32_t kLeastLength = 64; // what every encoder takes
@@ -93,7 +93,7 @@ Request FitIntoSize(Request request, const SourceInfo& source) {
     const double length = std::max(LengthToConvert(request, source), 0.001);
     const bool pictures = source.pictures && format.bHasVideo != 0;
     const bool sound = source.sound && format.bHasAudio != 0;
-    if (pictures && IsAmong(ChooseVideoCodec(request, format).value_or(0), {FourCC("FFV1"), FourCC("GIF ")}))
+    if (pictures && !QualityScaleOf(PictureCodecFor(request, format)))
         throw Failure(Category::kRequest, "a codec without a bit rate cannot keep below a size");
     const bool packets = IsAmong(format.fccFormat, {FourCC("TS  "), FourCC("M2TS"), FourCC("MPG ")});
     const auto tracks = static_cast<double>(1 + CarryPlan(source, request, format).FurtherSound().size());

@@ -172,7 +172,8 @@ private:
             return AsSteps<double>(figures, at, &AsQuality, kWanted);
         };
         if (!value.is_object() || IsLadder(value)) {
-            const uint32_t codec = preferences_.videoCodecs.empty() ? 0 : preferences_.videoCodecs.front();
+            const uint32_t codec =
+                preferences_.videoCodecs.empty() ? Preferences::kAnyCodec : preferences_.videoCodecs.front();
             preferences_.quality[codec] = steps(value, pointer);
             return;
         }

@@ -87,7 +87,6 @@ TEST(CodecPlan, WhatIsAskedForWinsOverWhatIsPreferred) {
     const FileFormatInfo& mkv = *FindFormat("mkv");
     const SourceInfo source = Source();
     Request request = To("o.mkv");
-    EXPECT_EQ(PlanPictures(request, mkv, *source.pictures).codec, std::nullopt);
     request.preferences.videoCodecs = {FourCC("H264"), FourCC("XVID")};
     request.preferences.quality[FourCC("H264")].from = {{0, 20}, {720, 23}};
     request.preferences.quality[0].from = {{0, 5}};
@@ -120,6 +119,31 @@ TEST(CodecPlan, WhatIsAskedForWinsOverWhatIsPreferred) {
     EXPECT_EQ(asked.size->height, 640);
     EXPECT_EQ(asked.frameRate, 50);
     EXPECT_EQ(PlanSound(request, mkv, *source.sound).rate, 384'000);
+}
+
+// A codec that nobody chose counts as one that somebody did: its scale of quality, and whether it has rates.
+TEST(CodecPlan, KnowsTheCodecThatNobodyChose) {
+    const struct {
+        const char* name;
+        uint32_t codec;
+        uint32_t soundCodec;
+        std::optional<double> quality; // of the 5 that is for all codecs
+        bool hasRates;
+    } formats[] = {{"mp4", FourCC("XVID"), FourCC("AAC "), 5, true},
+                   {"webm", FourCC("VP80"), FourCC("VORB"), 5, true},
+                   {"gif", FourCC("GIF "), 0, std::nullopt, false},
+                   {"mp3", 0, FourCC("MP3 "), std::nullopt, true}};
+    const SourceInfo source = Source();
+    for (const auto& [name, codec, soundCodec, quality, hasRates] : formats) {
+        SCOPED_TRACE(name);
+        const FileFormatInfo& format = *FindFormat(name);
+        Request request = To("o");
+        EXPECT_EQ(PictureCodecFor(request, format), codec);
+        EXPECT_EQ(SoundCodecFor(request, format), soundCodec);
+        EXPECT_EQ(HasRates(request, format, source), hasRates);
+        request.preferences.quality[Preferences::kAnyCodec].from = {{0, 5}};
+        EXPECT_EQ(PlanPictures(request, format, *source.pictures).quality, quality);
+    }
 }
 
 TEST(CodecPlan, RefusesWhatFormatOrCodecDoesNotHave) {
@@ -172,7 +196,9 @@ TEST(EncodePlan, FillsTheEnginesRecord) {
     // A format that does not carry the engine's codec gets its own first; one of a steady rate is told it.
     EXPECT_EQ(+plan(To("o.webm"), Source()).fccVideo, ChooseFormat(To("o.webm")).fccVideoCodecs[0]);
     EXPECT_EQ(double{plan(To("o.avi"), Source()).dFrameRate}, 25);
-    EXPECT_EQ(+plan(To("o.mp3"), Source()).bNoVideo, 1);
+    Request sound = To("o.mp3");
+    sound.quality = 20; // of pictures, which are left out
+    EXPECT_EQ(+plan(sound, Source()).bNoVideo, 1);
     SourceInfo silent = Source();
     silent.sound.reset();
     EXPECT_EQ(+plan(To("o.mp4"), silent).bNoAudio, 1);
@@ -224,6 +250,9 @@ TEST(SizePlan, ChoosesRatesThatFit) {
     Request little = To("o.mp4");
     little.maxSize = 100'000;
     EXPECT_TRUE(Refused([&] { FitIntoSize(little, Source()); }));
+    Request still = To("o.gif"); // has no rate
+    still.maxSize = 400'000'000;
+    EXPECT_TRUE(Refused([&] { FitIntoSize(still, Source()); }));
     Request unknown = To("o.mp4");
     unknown.maxSize = 20'000'000;
     SourceInfo pipe = Source();

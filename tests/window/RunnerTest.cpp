@@ -3,6 +3,7 @@
 #include "host/window/runner/Foresight.h"
 #include "host/window/runner/PresetShelf.h"
 #include "host/window/runner/Translation.h"
+#include "media/FourCC.h"
 #include "tests/support/Folder.h"
 
 #include <gtest/gtest.h>
@@ -220,6 +221,19 @@ TEST_F(RunnerTest, SavesWishesAsAPresetAndTakesThemBack) {
     EXPECT_EQ(movieconv::LoadPreset("mine").preferences.frameRate, 24);
 
     EXPECT_THROW(WritePreset("/proc/none/x.json", wishes), movieconv::PresetError);
+}
+
+TEST_F(RunnerTest, MovesAndSavesAQualityThatIsForAllCodecs) {
+    std::filesystem::create_directories(movieconv::OwnPresetFolder());
+    WriteFile(Own("flat"), R"({"parent": null, "format": "mkv", "video": {"quality": 10}})");
+    ASSERT_GE(OnShelf("flat").quality, 0);
+    Wishes wishes;
+    wishes.preset = "flat";
+    wishes.quality = OnShelf("flat").quality - 20;
+    WritePreset(Own("mine"), wishes);
+    EXPECT_NEAR(OnShelf("mine").quality, *wishes.quality, 3);
+    EXPECT_EQ(ToRequest(OrderOf(wishes, "o.mkv")).quality,
+              movieconv::LoadPreset("mine").preferences.QualitiesOf(FourCC("XVID"))->At(1080));
 }
 
 TEST_F(RunnerTest, SavesAPresetWithAllElseThatItsParentSays) {

@@ -80,25 +80,8 @@ const FileFormatInfo* FormatOf(const Preset& preset) {
 }
 
 std::optional<double> OwnQuality(const Preset& preset, uint32_t codec, int height) {
-    const auto& all = preset.preferences.quality;
-    for (const uint32_t key : {codec, uint32_t{0}}) // one of no codec is for all
-        if (const auto found = all.find(key); found != all.end())
-            return found->second.At(height);
-    return std::nullopt;
-}
-
-/// The codec that the preset takes for files of that format; nothing when it leaves pictures out or to
-/// others.
-std::optional<uint32_t> CodecOf(const Preset& preset, const FileFormatInfo* format) {
-    if (format == nullptr || preset.preferences.noVideo)
-        return std::nullopt;
-    Request request;
-    request.preferences = preset.preferences;
-    try {
-        return ChooseVideoCodec(request, *format);
-    } catch (const Failure&) {
-        return std::nullopt;
-    }
+    const Steps<double>* own = preset.preferences.QualitiesOf(codec);
+    return own != nullptr ? own->At(height) : std::nullopt;
 }
 
 /// The preset's own quality on the window's scale; -1 when it has none.
@@ -142,10 +125,10 @@ void WriteFile(const std::string& path, const QByteArray& text) {
 /// The preset's steps, moved to where the wish is.
 QJsonObject LadderOf(const Preset& preset, uint32_t codec, int wish) {
     QJsonObject ladder;
-    const auto own = preset.preferences.quality.find(codec);
-    if (own == preset.preferences.quality.end())
+    const Steps<double>* own = preset.preferences.QualitiesOf(codec);
+    if (own == nullptr)
         return ladder;
-    for (const auto& step : own->second.from)
+    for (const auto& step : own->from)
         if (const auto quality = QualityOf(preset, codec, step.first, wish))
             ladder[QString::number(step.first)] = *quality;
     return ladder;
@@ -278,6 +261,18 @@ QStringList WritePreset(const std::string& path, const Wishes& wishes) {
         json[QStringLiteral("audio")] = audio;
     WriteFile(path, QJsonDocument(json).toJson());
     return BeyondPresets(wishes);
+}
+
+std::optional<uint32_t> CodecOf(const Preset& preset, const FileFormatInfo* format) {
+    if (format == nullptr || preset.preferences.noVideo)
+        return std::nullopt;
+    Request request;
+    request.preferences = preset.preferences;
+    try {
+        return PictureCodecFor(request, *format);
+    } catch (const Failure&) {
+        return std::nullopt; // the library tells
+    }
 }
 
 std::optional<double> QualityOf(const Preset& preset, uint32_t codec, int height, int wish) {

@@ -68,15 +68,6 @@ double SoundRate(const Order& order, const Request& request) {
     return bits;
 }
 
-/// The codec that the request comes to; nothing when the format cannot carry it, which the library tells.
-std::optional<uint32_t> CodecOf(const Request& request, const FileFormatInfo& format) {
-    try {
-        return ChooseVideoCodec(request, format);
-    } catch (const Failure&) {
-        return std::nullopt;
-    }
-}
-
 void AskForSound(Request& request, const Wishes& wishes) {
     request.noAudio = !wishes.withSound;
     request.copySound = wishes.copySound.value_or(request.preferences.copySound);
@@ -102,7 +93,7 @@ void AskForPictures(Request& request, const FileFormatInfo& format, const Preset
     request.depth = wishes.depth;
     if (!wishes.quality)
         return;
-    if (const std::optional<uint32_t> codec = CodecOf(request, format))
+    if (const std::optional<uint32_t> codec = CodecOf(preset, &format))
         request.quality = QualityOf(preset, *codec, wishes.height.value_or(facts.height), *wishes.quality);
 }
 
