@@ -4,7 +4,9 @@
 #include "host/convert/Failure.h"
 #include "host/convert/Sources.h"
 #include "host/pieces/FileLock.h"
+#include "host/pieces/MarkText.h"
 #include "host/pieces/MovieErrand.h"
+#include "host/pieces/PlanChecks.h"
 #include "host/pieces/SettingsText.h"
 
 #include <algorithm>

@@ -3,7 +3,7 @@
 #define MOVIECONV_HOST_PIECES_BATCHJOURNAL_H
 
 #include "host/pieces/JsonName.h"
-#include "host/pieces/Plan.h"
+#include "host/pieces/SourceMark.h"
 
 #include <map>
 #include <mutex>

@@ -4,6 +4,8 @@
 #include "host/convert/OutputCheck.h"
 #include "host/pieces/CheckedLine.h"
 #include "host/pieces/FileBirth.h"
+#include "host/pieces/MarkText.h"
+#include "host/pieces/PlanChecks.h"
 #include "host/pieces/WholeFile.h"
 #include "text/Path.h"
 

@@ -13,6 +13,8 @@
 #include "host/convert/WorkClock.h"
 #include "host/convert/WriterWatch.h"
 #include "host/pieces/PieceFile.h"
+#include "host/pieces/PieceRequest.h"
+#include "host/pieces/PlanChecks.h"
 #include "host/source/MediaTime.h"
 #include "media/MediaWriter.h"
 #include "text/Utf8.h"

@@ -3,6 +3,7 @@
 #include "host/convert/Failure.h"
 #include "host/convert/OutputCheck.h"
 #include "host/pieces/Digest.h"
+#include "host/pieces/PlanText.h"
 #include "host/pieces/WholeFile.h"
 #include "text/Descriptor.h"
 #include "text/FileNames.h"
