@@ -1,7 +1,7 @@
 #include "host/pieces/PlanChecks.h"
 
-#include "api/MovieConv.h"
 #include "host/convert/Failure.h"
+#include "writer/WriterStatus.h"
 
 extern "C" {
 #include <libavcodec/avcodec.h>
@@ -36,7 +36,7 @@ void CheckUnchanged(const SourceMark& planned, const char* kind) {
 } // namespace
 
 std::map<std::string, std::string> CurrentVersions() {
-    return {{"movieconv", fmt::format("{}", VersionText(MWGetVersion()))},
+    return {{"movieconv", VersionText(MWGetVersion())},
             {"libavcodec", VersionText(avcodec_version())},
             {"libavformat", VersionText(avformat_version())},
             {"libavutil", VersionText(avutil_version())},

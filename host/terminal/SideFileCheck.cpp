@@ -15,11 +15,9 @@
 namespace movieconv {
 namespace {
 
-/// With --into, what stands in the output's place is an input, too.
-bool IsFurtherInput(const std::string& path, const Options& options) {
-    return options.into && (AreSame(path, options.request.output) ||
-                            std::any_of(options.further.begin(), options.further.end(),
-                                        [&](const std::string& input) { return AreSame(path, input); }));
+bool IsOneOfMany(const std::string& path, const Options& options) {
+    return std::any_of(options.inputs.begin(), options.inputs.end(),
+                       [&](const std::string& input) { return AreSame(path, input); });
 }
 
 /// With --into, also before it is there.
@@ -30,7 +28,7 @@ bool IsJournal(const std::string& path, const Options& options) {
 
 void CheckSideFile(const char* option, const std::string& path, const Options& options) {
     const Request& request = options.request;
-    const char* other = IsFurtherInput(path, options) ? "the source itself" : WhatIsReadFrom(path, request);
+    const char* other = IsOneOfMany(path, options) ? "the source itself" : WhatIsReadFrom(path, request);
     if (other == nullptr && !request.output.empty() && IsOutput(path, request))
         other = "the output or a part of it";
     if (IsJournal(path, options))
