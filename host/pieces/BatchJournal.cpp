@@ -5,6 +5,7 @@
 #include "host/pieces/Digest.h"
 #include "host/pieces/FileBirth.h"
 #include "host/pieces/MarkText.h"
+#include "host/pieces/OutputNames.h"
 #include "host/pieces/WholeFile.h"
 #include "text/Path.h"
 
@@ -27,7 +28,7 @@ std::string TaskOf(const SourceMark& source, const std::string& settings) {
 
 } // namespace
 
-BatchJournal::BatchJournal(const std::string& folder) : path_(folder + "/" + kName) {
+BatchJournal::BatchJournal(const std::string& folder) : path_(JournalIn(folder)) {
     struct stat status {};
     if (lstat(path_.c_str(), &status) != 0)
         return;

@@ -22,8 +22,6 @@ public:
         kDone,    ///< It was made of this source with these settings, and still stands there.
     };
 
-    static constexpr char kName[] = "movieconv.journal"; ///< In the folder.
-
     /// Reads what is there. Throws Failure when it cannot be read, or is something else.
     explicit BatchJournal(const std::string& folder);
 

@@ -12,6 +12,7 @@
 #include "host/convert/Timecode.h"
 #include "host/convert/WorkClock.h"
 #include "host/convert/WriterWatch.h"
+#include "host/pieces/OutputNames.h"
 #include "host/pieces/PieceFile.h"
 #include "host/pieces/PieceRequest.h"
 #include "host/pieces/PlanChecks.h"

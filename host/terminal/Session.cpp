@@ -4,6 +4,7 @@
 #include "host/pieces/Batch.h"
 #include "host/pieces/ClipRun.h"
 #include "host/pieces/Foreman.h"
+#include "host/pieces/OutputNames.h"
 
 #include <chrono>
 #include <functional>
