@@ -7,7 +7,7 @@
 #include "host/presets/Preset.h"
 #include "host/terminal/ControlInput.h"
 #include "host/terminal/Describe.h"
-#include "host/terminal/JsonReporter.h"
+#include "host/terminal/JsonLine.h"
 #include "host/terminal/Listings.h"
 #include "host/terminal/MainLoop.h"
 #include "host/terminal/Options.h"
