@@ -4,7 +4,10 @@
 #include "host/convert/Failure.h"
 #include "host/convert/Sources.h"
 #include "host/pieces/FileLock.h"
+#include "host/pieces/MarkText.h"
 #include "host/pieces/MovieErrand.h"
+#include "host/pieces/OutputNames.h"
+#include "host/pieces/PlanChecks.h"
 #include "host/pieces/SettingsText.h"
 
 #include <algorithm>
@@ -208,9 +211,10 @@ std::string Batch::OutputFor(const std::string& input, const std::string& extens
     std::string name = order_.names;
     Replace(name, "{ext}", extension);
     Replace(name, "{name}", fs::path(input).stem().string());
-    if (name.empty() || name.find('/') != std::string::npos || name == BatchJournal::kName)
+    std::string path = order_.folder + "/" + name;
+    if (name.empty() || name.find('/') != std::string::npos || path == JournalIn(order_.folder))
         throw Failure(Category::kRequest, fmt::format("\"{}\" makes no name of \"{}\"", order_.names, input));
-    return order_.folder + "/" + name;
+    return path;
 }
 
 std::optional<Crew::Assignment> Batch::Next() {

@@ -4,6 +4,8 @@
 #include "host/pieces/CheckedLine.h"
 #include "host/pieces/Digest.h"
 #include "host/pieces/FileBirth.h"
+#include "host/pieces/MarkText.h"
+#include "host/pieces/OutputNames.h"
 #include "host/pieces/WholeFile.h"
 #include "text/Path.h"
 
@@ -20,18 +22,13 @@ namespace {
 constexpr int64_t kLargestJournal = 256 << 20;
 constexpr std::string_view kLineHead = "{\"state\":"; // with which Note begins
 
-std::string HashOf(const SourceMark& mark) {
-    return DigestOf(
-        fmt::format("{}\n{}\n{}\n{}\n{}", mark.path, mark.bytes, mark.modified, mark.head, mark.tail));
-}
-
 std::string TaskOf(const SourceMark& source, const std::string& settings) {
     return DigestOf(HashOf(source) + "\n" + settings);
 }
 
 } // namespace
 
-BatchJournal::BatchJournal(const std::string& folder) : path_(folder + "/" + kName) {
+BatchJournal::BatchJournal(const std::string& folder) : path_(JournalIn(folder)) {
     struct stat status {};
     if (lstat(path_.c_str(), &status) != 0)
         return;

@@ -3,7 +3,7 @@
 #define MOVIECONV_HOST_PIECES_BATCHJOURNAL_H
 
 #include "host/pieces/JsonName.h"
-#include "host/pieces/Plan.h"
+#include "host/pieces/SourceMark.h"
 
 #include <map>
 #include <mutex>
@@ -21,8 +21,6 @@ public:
         kBegun,   ///< It was begun from this source with these settings, and how that ended is not known.
         kDone,    ///< It was made of this source with these settings, and still stands there.
     };
-
-    static constexpr char kName[] = "movieconv.journal"; ///< In the folder.
 
     /// Reads what is there. Throws Failure when it cannot be read, or is something else.
     explicit BatchJournal(const std::string& folder);

@@ -4,6 +4,9 @@
 #include "host/convert/OutputCheck.h"
 #include "host/pieces/CheckedLine.h"
 #include "host/pieces/FileBirth.h"
+#include "host/pieces/MarkText.h"
+#include "host/pieces/OutputNames.h"
+#include "host/pieces/PlanChecks.h"
 #include "host/pieces/WholeFile.h"
 #include "text/Path.h"
 
@@ -44,7 +47,7 @@ bool IsHeader(const std::optional<Json>& line) {
 
 } // namespace
 
-ClipJournal::ClipJournal(const Request& request) : request_(request), path_(request.output + ".clips") {}
+ClipJournal::ClipJournal(const Request& request) : request_(request), path_(ClipListFor(request.output)) {}
 
 bool ClipJournal::Exists() const {
     return access(path_.c_str(), F_OK) == 0;

@@ -1,6 +1,7 @@
 #include "host/pieces/FileLock.h"
 
 #include "host/convert/Failure.h"
+#include "host/pieces/OutputNames.h"
 
 #include <cerrno>
 #include <fcntl.h>
@@ -33,7 +34,7 @@ bool IsEmptyFile(const std::string& path) {
 FileLock::FileLock(const std::string& path)
     : file_(open(path.c_str(), kLockFlags)), state_(Lock(file_.Number())) {}
 
-PlanLock::PlanLock(const std::string& planPath) : path_(planPath + ".lock") {
+PlanLock::PlanLock(const std::string& planPath) : path_(LockPathFor(planPath)) {
     while (!Take()) {
     }
     if (lock_->Result() == FileLock::State::kElsewhere)

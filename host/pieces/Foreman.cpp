@@ -4,7 +4,12 @@
 #include "host/convert/Failure.h"
 #include "host/convert/OutputCheck.h"
 #include "host/convert/Room.h"
+#include "host/pieces/OutputNames.h"
 #include "host/pieces/PieceFile.h"
+#include "host/pieces/PieceRequest.h"
+#include "host/pieces/PlanChecks.h"
+#include "host/pieces/PlanText.h"
+#include "host/pieces/Planner.h"
 #include "host/pieces/WholeFile.h"
 #include "host/source/MediaTime.h"
 #include "text/FileNames.h"
@@ -108,10 +113,6 @@ private:
     const bool fromStart_;
     int64_t pictures_ = 0;
 };
-
-std::string PlanPathFor(const std::string& output) {
-    return output + ".plan";
-}
 
 Foreman::Foreman(PieceOrder order, Observer& observer, Loop loop)
     : Crew(observer, std::move(loop)), order_(std::move(order)) {}

@@ -29,9 +29,6 @@ struct PieceOrder {
     int jobs = 1;     ///< Pieces at once; 0: as many as processors and memory allow.
 };
 
-/// The plan that a conversion in pieces keeps beside its output.
-std::string PlanPathFor(const std::string& output);
-
 class Foreman final : public Crew {
 public:
     /// `observer` hears of all pieces together as of one conversion, by means of `loop`.

@@ -2,6 +2,7 @@
 
 #include <cctype>
 #include <cstddef>
+#include <filesystem>
 #include <fmt/format.h>
 #include <stdexcept>
 
@@ -42,6 +43,21 @@ std::string NameFromJson(const Json& json) {
         name += static_cast<char>(std::stoi(byte, nullptr, 16));
     }
     return name;
+}
+
+std::string PathFromJson(const Json& json) {
+    std::string text = NameFromJson(json);
+    const std::filesystem::path path(text);
+    if (!path.is_absolute() || path.lexically_normal() != path || text.find('\0') != std::string::npos)
+        throw std::invalid_argument(fmt::format("\"{}\" is not an absolute path without detours", text));
+    return text;
+}
+
+int64_t Natural(const Json& json, const char* name) {
+    const Json& value = json.at(name);
+    if (!value.is_number_integer() || value.get<int64_t>() < 0)
+        throw std::invalid_argument(fmt::format("\"{}\" is not a number from 0 on", name));
+    return value.get<int64_t>();
 }
 
 } // namespace movieconv

@@ -3,6 +3,8 @@
 #include "host/convert/Failure.h"
 #include "host/convert/OutputCheck.h"
 #include "host/pieces/Digest.h"
+#include "host/pieces/OutputNames.h"
+#include "host/pieces/PlanText.h"
 #include "host/pieces/WholeFile.h"
 #include "text/Descriptor.h"
 #include "text/FileNames.h"
@@ -11,7 +13,6 @@
 
 #include <algorithm>
 #include <cerrno>
-#include <charconv>
 #include <cstring>
 #include <fcntl.h>
 #include <filesystem>
@@ -24,7 +25,6 @@ namespace movieconv {
 namespace {
 
 constexpr std::size_t kDigits = 64;
-constexpr std::string_view kSuffix = ".piece";
 constexpr std::string_view kPieceHead = "MCPIECE1"; // with which the media writer begins one
 
 /// The seal without its last line.
@@ -46,17 +46,6 @@ int64_t SizeOf(const text::Descriptor& file) {
     return file.Number() >= 0 && fstat(file.Number(), &status) == 0 && S_ISREG(status.st_mode)
                ? status.st_size
                : -1;
-}
-
-/// The number of the piece whose name a file's begins with, as PiecePath writes it.
-std::optional<int> NumberIn(const std::string& name, const std::string& planPath) {
-    const std::string plan = text::NameOf(planPath) + ".";
-    int number = -1;
-    if (name.starts_with(plan))
-        std::from_chars(name.data() + plan.size(), name.data() + name.size(), number);
-    const bool isNumber =
-        number >= 0 && number <= kMostPieces && name.starts_with(text::NameOf(PiecePath(planPath, number)));
-    return isNumber ? std::optional(number) : std::nullopt;
 }
 
 /// The number of the piece whose name a file has.
@@ -94,10 +83,6 @@ std::vector<std::filesystem::path> FilesOf(const std::string& planPath) {
 }
 
 } // namespace
-
-std::string PiecePath(const std::string& planPath, int number) {
-    return fmt::format("{}.{:04}{}", planPath, number, kSuffix);
-}
 
 int64_t SealPiece(const std::string& file, const Plan& plan, const std::string& planPath, int number) {
     const std::string name = PiecePath(planPath, number);

@@ -14,9 +14,6 @@
 
 namespace movieconv {
 
-/// The place of a piece, beside its plan.
-std::string PiecePath(const std::string& planPath, int number);
-
 /// Seals a written file as a piece of the plan and gives it the piece's name, lastingly. The bytes in it.
 /// Throws Failure, and the file is gone then.
 int64_t SealPiece(const std::string& file, const Plan& plan, const std::string& planPath, int number);

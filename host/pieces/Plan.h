@@ -4,26 +4,15 @@
 #define MOVIECONV_HOST_PIECES_PLAN_H
 
 #include "host/convert/Request.h"
+#include "host/pieces/SourceMark.h"
 
 #include <cstdint>
-#include <filesystem>
-#include <functional>
 #include <map>
 #include <optional>
 #include <string>
 #include <vector>
 
 namespace movieconv {
-
-/// What tells whether a file is still the one that was looked at.
-struct SourceMark {
-    std::string path; ///< Absolute.
-    int64_t bytes = 0;
-    int64_t modified = 0; ///< Nanoseconds since 1970.
-    std::string head;     ///< SHA-256 of its first 64 KiB,
-    std::string tail;     ///< and of its last.
-    bool operator==(const SourceMark&) const = default;
-};
 
 /// How the pictures are divided; by default into pieces of a minute at least.
 struct Division {
@@ -61,48 +50,6 @@ struct Plan {
     int Pieces() const { return static_cast<int>(pictures.size()) + 1; }
     bool IsRest(int number) const { return number == static_cast<int>(pictures.size()); }
 };
-
-/// Of the program and of the libraries that decide what is in a piece, by name.
-std::map<std::string, std::string> CurrentVersions();
-
-/// Looks at a file. Throws Failure when it cannot be read, or not twice.
-SourceMark MarkOf(const std::string& path);
-
-/// Looks at the files of subtitles that a request names, and lets it name them from anywhere. Throws Failure.
-std::vector<SourceMark> MarkTexts(Request& request);
-
-/// Throws Failure that says what differs when the source, a file of subtitles or this program is not the one
-/// that was planned with.
-void CheckAgainst(const Plan& plan);
-
-/// What differs, in words; empty when nothing does. `now` need not be divided yet.
-std::string Difference(const Plan& before, const Plan& now);
-
-/// The plan of a request, a conversion of one file with pictures, as far as the source's stamps are not
-/// needed. Throws Failure when that is impossible.
-Plan BeginPlan(const Request& request, const Division& division);
-
-/// Completes it: reads the source's stamps and divides it. `stopped` is asked now and then. Throws Failure
-/// when that is impossible; nothing when it was stopped.
-std::optional<Plan> MakePlan(Plan plan, const std::function<bool()>& stopped);
-
-/// What pieces cost where the pictures have a bit rate, a sentence; empty where they do not.
-std::string TellBitRate(const Plan& plan);
-
-/// Reads a plan. Throws Failure when there is none of that name, or it is not as it was written.
-Plan ReadPlan(const std::string& path);
-
-/// Writes it in one step, and to the disk; sets its hash. Throws Failure.
-void WritePlan(const std::string& path, Plan& plan);
-
-/// Whether a file is what WritePlan left of a plan of that name when it was killed.
-bool IsPlanInTheMaking(const std::filesystem::path& file, const std::string& path);
-
-/// What names the files that the plan's conversion reads, and its output.
-Request WholeRequest(const Plan& plan);
-
-/// The conversion that makes a piece, 0 to Pieces() - 1, into the file `output`.
-Request RequestFor(const Plan& plan, int number, const std::string& output);
 
 } // namespace movieconv
 

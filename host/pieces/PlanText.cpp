@@ -1,7 +1,9 @@
+#include "host/pieces/PlanText.h"
+
 #include "host/convert/Failure.h"
 #include "host/pieces/CheckedLine.h"
 #include "host/pieces/Digest.h"
-#include "host/pieces/Plan.h"
+#include "host/pieces/MarkText.h"
 #include "host/pieces/SettingsText.h"
 #include "host/pieces/WholeFile.h"
 #include "media/MediaRecords.h"
@@ -73,32 +75,6 @@ std::string HashOf(const Json& json) {
     throw std::invalid_argument(why);
 }
 
-int64_t Natural(const Json& json, const char* name) {
-    const Json& value = json.at(name);
-    if (!value.is_number_integer() || value.get<int64_t>() < 0)
-        RefusePlan(fmt::format("\"{}\" is not a number from 0 on", name));
-    return value.get<int64_t>();
-}
-
-/// A path that names one place, without going back on its way.
-std::string Path(const Json& json) {
-    std::string text = NameFromJson(json);
-    const std::filesystem::path path(text);
-    if (!path.is_absolute() || path.lexically_normal() != path || text.find('\0') != std::string::npos)
-        RefusePlan(fmt::format("\"{}\" is not an absolute path without detours", text));
-    return text;
-}
-
-SourceMark MarkFrom(const Json& json) {
-    SourceMark mark;
-    mark.path = Path(json.at("path"));
-    mark.bytes = Natural(json, "bytes");
-    mark.modified = json.at("modified").get<int64_t>();
-    mark.head = json.at("headSha256").get<std::string>();
-    mark.tail = json.at("tailSha256").get<std::string>();
-    return mark;
-}
-
 Piece PieceFrom(const Json& json) {
     Piece piece;
     piece.begin = json.at("begin").get<int64_t>();
@@ -136,10 +112,10 @@ Plan PlanFrom(const Json& json) {
     Plan plan;
     plan.pictures = PiecesFrom(json.at("pieces"));
     plan.versions = json.at("madeWith").get<std::map<std::string, std::string>>();
-    plan.source = MarkFrom(json.at("source"));
+    plan.source = MarkFromJson(json.at("source"));
     for (const Json& text : json.at("texts"))
-        plan.texts.push_back(MarkFrom(text));
-    plan.output = Path(json.at("output"));
+        plan.texts.push_back(MarkFromJson(text));
+    plan.output = PathFromJson(json.at("output"));
     plan.settings = SettingsFromJson(json.at("settings"));
     plan.fromStart = json.at("readFromStart").get<bool>();
     plan.hasRates = json.at("hasRates").get<bool>();

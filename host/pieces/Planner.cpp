@@ -1,3 +1,5 @@
+#include "host/pieces/Planner.h"
+
 #include "api/MovieConv.h"
 #include "host/convert/CodecPlan.h"
 #include "host/convert/EncodePlan.h"
@@ -5,18 +7,11 @@
 #include "host/convert/Failure.h"
 #include "host/convert/SizePlan.h"
 #include "host/convert/Sources.h"
-#include "host/pieces/Plan.h"
+#include "host/pieces/PlanChecks.h"
 #include "host/source/MediaTime.h"
 #include "media/FourCC.h"
 #include "media/MediaWriter.h"
 #include "writer/WriterStatus.h"
-
-extern "C" {
-#include <libavcodec/avcodec.h>
-#include <libavformat/avformat.h>
-#include <libswresample/swresample.h>
-#include <libswscale/swscale.h>
-}
 
 #include <algorithm>
 #include <filesystem>
@@ -36,10 +31,6 @@ struct Stamps {
     int64_t end = 0;
     bool clockJumps = false;
 };
-
-std::string VersionText(unsigned version) {
-    return fmt::format("{}.{}.{}", version >> 16, version >> 8 & 0xFF, version & 0xFF);
-}
 
 /// Why no pieces can be made of what is asked for; empty when they can.
 std::string Obstacle(const Request& request, const Division& division) {
@@ -222,15 +213,6 @@ std::vector<Piece> PiecesOf(const Stamps& stamps, const std::vector<std::size_t>
 
 } // namespace
 
-std::map<std::string, std::string> CurrentVersions() {
-    return {{"movieconv", fmt::format("{}", VersionText(MWGetVersion()))},
-            {"libavcodec", VersionText(avcodec_version())},
-            {"libavformat", VersionText(avformat_version())},
-            {"libavutil", VersionText(avutil_version())},
-            {"libswscale", VersionText(swscale_version())},
-            {"libswresample", VersionText(swresample_version())}};
-}
-
 Plan BeginPlan(const Request& request, const Division& division) {
     if (const std::string obstacle = Obstacle(request, division); !obstacle.empty())
         throw Failure(Category::kRequest, obstacle);
@@ -286,40 +268,6 @@ std::string TellBitRate(const Plan& plan) {
         "the bit rate begins anew in each of {} pieces of {:.0f} s: pieces below 20 s make the "
         "output larger by more than 4 %; a constant quality does not",
         plan.pictures.size(), seconds);
-}
-
-Request WholeRequest(const Plan& plan) {
-    Request request = plan.settings;
-    request.input = plan.source.path;
-    request.output = plan.output;
-    return request;
-}
-
-Request RequestFor(const Plan& plan, int number, const std::string& output) {
-    Request request = WholeRequest(plan);
-    request.output = output;
-    request.overwrite = true; // whatever was left there
-    request.keepPartial = false;
-    request.maxSize.reset();    // the rates are chosen for it
-    request.encoderThreads = 1; // more of them may change the bytes from run to run
-    PieceCut cut;
-    cut.pictures = !plan.IsRest(number);
-    cut.origin = plan.pictures.front().begin;
-    cut.fromStart = plan.fromStart;
-    if (cut.pictures) {
-        const auto place = static_cast<std::size_t>(number);
-        const Piece& piece = plan.pictures[place];
-        cut.begin = piece.begin;
-        cut.end = piece.end;
-        cut.until = piece.until;
-        cut.last = place + 1 == plan.pictures.size();
-        cut.tick = piece.tick;
-        if (number > 0)
-            request.begin = ToSeconds(piece.begin);
-        request.length = ToSeconds(piece.until - piece.begin);
-    }
-    request.piece = cut;
-    return request;
 }
 
 } // namespace movieconv

@@ -254,21 +254,6 @@ Json WishesAsJson(const Request& request) {
     return json;
 }
 
-Json MarkAsJson(const SourceMark& source) {
-    return {{"path", NameAsJson(source.path)},
-            {"bytes", source.bytes},
-            {"modified", source.modified},
-            {"headSha256", source.head},
-            {"tailSha256", source.tail}};
-}
-
-Json MarksAsJson(const std::vector<SourceMark>& marks) {
-    Json list = Json::array();
-    for (const SourceMark& mark : marks)
-        list.push_back(MarkAsJson(mark));
-    return list;
-}
-
 std::string DifferenceIn(const Json& before, const Json& now, const std::vector<std::string>& parts) {
     const auto text = [](const Json& json, const std::string& key) {
         return json.contains(key) ? json.at(key).dump() : std::string("nothing");

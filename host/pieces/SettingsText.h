@@ -4,7 +4,6 @@
 
 #include "host/convert/Request.h"
 #include "host/pieces/JsonName.h"
-#include "host/pieces/Plan.h"
 
 #include <string>
 #include <vector>
@@ -16,9 +15,6 @@ Json SettingsAsJson(const Request& request);
 
 /// The same with what a plan has worked out already: everything that was asked for.
 Json WishesAsJson(const Request& request);
-
-Json MarkAsJson(const SourceMark& source);
-Json MarksAsJson(const std::vector<SourceMark>& marks);
 
 /// What differs between two objects in these parts of them, which are objects themselves, in words; empty
 /// when nothing does.

@@ -1,4 +1,4 @@
-#include "host/pieces/Plan.h"
+#include "host/pieces/SourceMark.h"
 
 #include "host/convert/Failure.h"
 #include "host/pieces/Digest.h"
@@ -29,20 +29,6 @@ std::string EdgeOf(const std::string& path, int descriptor, int64_t offset, int6
     if (!AddFile(digest, descriptor, offset, size))
         throw CannotRead(path, errno != 0 ? std::strerror(errno) : "it became shorter meanwhile");
     return digest.Hex();
-}
-
-void CheckUnchanged(const SourceMark& planned, const char* kind) {
-    const SourceMark now = MarkOf(planned.path);
-    std::string what;
-    if (now.bytes != planned.bytes)
-        what = fmt::format("it has {} bytes, not {}", now.bytes, planned.bytes);
-    else if (now.head != planned.head || now.tail != planned.tail)
-        what = "it holds something else";
-    else if (now.modified != planned.modified)
-        what = "it was written to since";
-    if (!what.empty())
-        throw Failure(Category::kSource,
-                      fmt::format("\"{}\" is not {} that was planned with: {}", planned.path, kind, what));
 }
 
 } // namespace
@@ -83,20 +69,6 @@ std::vector<SourceMark> MarkTexts(Request& request) {
         *name = marks.back().path;
     }
     return marks;
-}
-
-void CheckAgainst(const Plan& plan) {
-    CheckUnchanged(plan.source, "the source");
-    for (const SourceMark& text : plan.texts)
-        CheckUnchanged(text, "the file of subtitles");
-    for (const auto& [name, version] : CurrentVersions()) {
-        const auto planned = plan.versions.find(name);
-        if (planned == plan.versions.end() || planned->second != version)
-            throw Failure(Category::kRequest,
-                          fmt::format("the plan was made with {} {}, here is {}: the pieces would not fit",
-                                      name, planned == plan.versions.end() ? "unknown" : planned->second,
-                                      version));
-    }
 }
 
 } // namespace movieconv

@@ -1,6 +1,6 @@
 #include "host/terminal/Describe.h"
 
-#include "host/terminal/JsonReporter.h"
+#include "host/terminal/JsonLine.h"
 
 #include <nlohmann/json.hpp>
 

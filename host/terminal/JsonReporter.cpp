@@ -1,19 +1,21 @@
 #include "host/terminal/JsonReporter.h"
 
-#include "text/Printable.h"
-#include "text/Utf8.h"
+#include "host/terminal/JsonLine.h"
 
 #include <cmath>
-#include <fmt/format.h>
 #include <nlohmann/json.hpp>
+#include <utility>
 
 namespace movieconv {
 namespace {
 
+using Json = nlohmann::ordered_json;
+
 constexpr double kReportInterval = 0.25;
 
-std::string Number(std::optional<double> value) {
-    return value && std::isfinite(*value) ? fmt::format("{:.3f}", *value) : "null";
+/// To thousandths.
+Json Rounded(std::optional<double> value) {
+    return value && std::isfinite(*value) ? Json(std::round(*value * 1000) / 1000) : Json(nullptr);
 }
 
 std::string_view PhaseName(Phase phase) {
@@ -30,109 +32,80 @@ std::string_view PhaseName(Phase phase) {
     return "converting";
 }
 
-/// The field that tells which of many movies it is; none where there is but one.
-std::string InputField(const std::string& input) {
-    return input.empty() ? "" : fmt::format(",\"input\":{}", JsonString(input));
+/// With what tells which of many movies it is about; where there is but one, nothing does.
+Json About(const std::string& input, Json fields) {
+    if (!input.empty())
+        fields["input"] = input;
+    return fields;
 }
 
 } // namespace
 
-std::string EscapeCommands(std::string_view json) {
-    std::string escaped;
-    for (const wchar_t character : text::FromUtf8(json)) {
-        if (character >= 0x7F && text::IsCommand(character))
-            escaped += fmt::format("\\u{:04x}", static_cast<unsigned>(character));
-        else
-            escaped += text::ToUtf8({&character, 1});
-    }
-    return escaped;
-}
-
-std::string JsonString(std::string_view bytes) {
-    std::wstring wide = text::FromUtf8(bytes);
-    for (wchar_t& character : wide)
-        if (character >= 0xDC80 && character <= 0xDCFF)
-            character = 0xFFFD;
-    std::string quoted = "\"";
-    for (const char c : text::ToUtf8(wide)) {
-        if (c == '"' || c == '\\') {
-            quoted += '\\';
-            quoted += c;
-        } else if (static_cast<unsigned char>(c) < 0x20) {
-            quoted += fmt::format("\\u{:04x}", static_cast<unsigned>(c));
-        } else {
-            quoted += c;
-        }
-    }
-    return EscapeCommands(quoted + '"');
-}
-
-std::string JsonLine(std::string_view event, const nlohmann::ordered_json& fields) {
-    using Json = nlohmann::ordered_json;
-    Json object{{"v", JsonReporter::kVersion}, {"event", event}};
-    object.update(fields);
-    return EscapeCommands(object.dump(-1, ' ', false, Json::error_handler_t::replace)) + "\n";
-}
-
-void JsonReporter::Print(std::string_view event, const std::string& fields) const {
-    streams_.Report(fmt::format("{{\"v\":{},\"event\":\"{}\"{}{}}}\n", kVersion, event,
-                                fields.empty() ? "" : ",", fields));
+void JsonReporter::Print(std::string_view event, const Json& fields) const {
+    streams_.Report(JsonLine(event, fields));
 }
 
 void JsonReporter::Started(const Start& report) {
-    Print("start", fmt::format("\"input\":{},\"output\":{},\"length_s\":{}", JsonString(report.input),
-                               JsonString(report.output),
-                               Number(report.lengthIsKnown ? std::optional(report.length) : std::nullopt)));
+    Print("start", {{"input", report.input},
+                    {"output", report.output},
+                    {"length_s", report.lengthIsKnown ? Rounded(report.length) : Json(nullptr)}});
 }
 
 void JsonReporter::Progressed(const Progress& report) {
     if (!report.phaseChanged && report.worked < nextAt_)
         return;
     nextAt_ = report.worked + kReportInterval;
-    const std::string expected =
-        report.expected ? fmt::format("[{},{}]", report.expected->least, report.expected->most) : "null";
-    Print("progress",
-          fmt::format("\"phase\":\"{}\",\"percent\":{},\"position_s\":{},\"speed\":{},\"left_s\":{},"
-                      "\"worked_s\":{},\"bytes\":{},\"expected_bytes\":{},\"finished\":{},\"clip\":{}",
-                      PhaseName(report.phase), Number(report.percent), Number(report.position),
-                      Number(report.speed), Number(report.left), Number(report.worked), report.bytes,
-                      expected, Number(report.finished), report.clip));
+    const Json expected =
+        report.expected ? Json::array({report.expected->least, report.expected->most}) : Json(nullptr);
+    Print("progress", {{"phase", PhaseName(report.phase)},
+                       {"percent", Rounded(report.percent)},
+                       {"position_s", Rounded(report.position)},
+                       {"speed", Rounded(report.speed)},
+                       {"left_s", Rounded(report.left)},
+                       {"worked_s", Rounded(report.worked)},
+                       {"bytes", report.bytes},
+                       {"expected_bytes", expected},
+                       {"finished", Rounded(report.finished)},
+                       {"clip", report.clip}});
 }
 
 void JsonReporter::Opened(const OpenedFile& report) {
-    Print("clip_opened", fmt::format("\"number\":{},\"path\":{}{}", report.number, JsonString(report.path),
-                                     InputField(report.input)));
+    Print("clip_opened", About(report.input, {{"number", report.number}, {"path", report.path}}));
 }
 
 void JsonReporter::Closed(const ClosedFile& report) {
-    Print("clip_closed", fmt::format("\"number\":{},\"path\":{},\"video_s\":{},\"audio_s\":{},\"bytes\":{}{}",
-                                     report.number, JsonString(report.path), Number(report.videoSeconds),
-                                     Number(report.audioSeconds), report.bytes, InputField(report.input)));
+    Print("clip_closed", About(report.input, {{"number", report.number},
+                                              {"path", report.path},
+                                              {"video_s", Rounded(report.videoSeconds)},
+                                              {"audio_s", Rounded(report.audioSeconds)},
+                                              {"bytes", report.bytes}}));
 }
 
 void JsonReporter::LeftBehind(const NotCarried& report) {
     Print("not_carried",
-          fmt::format("\"kind\":{},\"number\":{},\"codec\":{},\"language\":{},\"reason\":{}{}",
-                      JsonString(report.kind), report.number ? std::to_string(*report.number) : "null",
-                      JsonString(report.codec), JsonString(report.language), JsonString(report.reason),
-                      InputField(report.input)));
+          About(report.input, {{"kind", report.kind},
+                               {"number", report.number ? Json(*report.number) : Json(nullptr)},
+                               {"codec", report.codec},
+                               {"language", report.language},
+                               {"reason", report.reason}}));
 }
 
 void JsonReporter::Warn(const std::string& text, const std::string& input) {
-    Print("warning", fmt::format("\"text\":{}{}", JsonString(text), InputField(input)));
+    Print("warning", About(input, {{"text", text}}));
 }
 
 void JsonReporter::Error(const std::string& text) {
-    Print("error", fmt::format("\"text\":{}", JsonString(text)));
-    streams_.PrintError(fmt::format("movieconv: error: {}", text));
+    Print("error", {{"text", text}});
+    streams_.PrintError("movieconv: error: " + text);
 }
 
 void JsonReporter::End(const EndReport& report) {
-    Print("end",
-          fmt::format("\"outcome\":\"{}\",\"exit_code\":{},\"position_s\":{},\"worked_s\":{},\"bytes\":{},"
-                      "\"files\":{}",
-                      report.outcome, static_cast<int>(report.code), Number(report.position),
-                      Number(report.worked), report.bytes, report.files));
+    Print("end", {{"outcome", report.outcome},
+                  {"exit_code", static_cast<int>(report.code)},
+                  {"position_s", Rounded(report.position)},
+                  {"worked_s", Rounded(report.worked)},
+                  {"bytes", report.bytes},
+                  {"files", report.files}});
 }
 
 } // namespace movieconv

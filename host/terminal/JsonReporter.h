@@ -1,4 +1,4 @@
-// Reports for programs: one JSON object a line, described in docs/progress-json.md.
+// Reports for programs.
 #ifndef MOVIECONV_HOST_TERMINAL_JSONREPORTER_H
 #define MOVIECONV_HOST_TERMINAL_JSONREPORTER_H
 
@@ -12,9 +12,6 @@ namespace movieconv {
 
 class JsonReporter final : public Reporter {
 public:
-    /// Of everything that is told as JSON.
-    static constexpr int kVersion = 1;
-
     explicit JsonReporter(const StandardStreams& streams) : streams_(streams) {}
 
     void Started(const Start& report) override;
@@ -27,21 +24,11 @@ public:
     void End(const EndReport& report) override;
 
 private:
-    void Print(std::string_view event, const std::string& fields) const;
+    void Print(std::string_view event, const nlohmann::ordered_json& fields) const;
 
     const StandardStreams& streams_;
     double nextAt_ = 0; // seconds of work
 };
-
-/// The same JSON, with what terminals obey written as numbers. `json` has none of it but line ends outside of
-/// its strings.
-std::string EscapeCommands(std::string_view json);
-
-/// A JSON string with its quotes. Bytes that are not UTF-8 become U+FFFD.
-std::string JsonString(std::string_view bytes);
-
-/// An object of the stream with these fields, and the line's end.
-std::string JsonLine(std::string_view event, const nlohmann::ordered_json& fields);
 
 } // namespace movieconv
 

@@ -2,7 +2,7 @@
 
 #include "host/convert/Formats.h"
 #include "host/presets/Preset.h"
-#include "host/terminal/JsonReporter.h"
+#include "host/terminal/JsonLine.h"
 #include "media/MediaWriter.h"
 #include "text/Printable.h"
 

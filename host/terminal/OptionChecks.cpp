@@ -27,12 +27,12 @@ void CheckPlaces(const Options& options) {
     const bool other = options.task != Task::kConvert || options.preview || options.resume ||
                        options.request.split || options.division.pieces || options.division.length;
     Require({
-        {!options.into && (!options.further.empty() || options.names),
+        {!options.into && (!options.inputs.empty() || options.names),
          "more than INPUT and OUTPUT, and --names, go with --into"},
         {options.into && other, "--into converts many movies: it excludes --split, --preview, --resume, "
                                 "--pieces, --piece-length and "
                                 "what is done instead of converting"},
-        {NeedsInput(options.task) && options.request.input.empty(),
+        {options.into ? options.inputs.empty() : NeedsInput(options.task) && options.request.input.empty(),
          "INPUT is missing; try \"movieconv --help\""},
         {NeedsOutput(options.task) && !options.into && options.request.output.empty(),
          "OUTPUT is missing; try \"movieconv --help\""},

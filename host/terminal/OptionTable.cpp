@@ -227,7 +227,7 @@ void AddOptions(CLI::App& app, Options& options) {
     app.add_option("INPUT", options.request.input, "The movie to convert, any that FFmpeg can read")
         ->type_name("");
     app.add_option("OUTPUT", options.request.output, "The file to make")->type_name("");
-    app.add_option("FURTHER", options.further)->type_name("")->group("");
+    app.add_option("FURTHER", options.inputs)->type_name("")->group("");
     AddRange(app, options);
     AddEncoding(app, options);
     AddPictures(app, options);

@@ -69,6 +69,13 @@ std::vector<std::string> NotTornApart(std::vector<std::string> arguments) {
     return arguments;
 }
 
+/// With --into, OUTPUT is a movie, too.
+void TakeInputs(Options& options) {
+    for (std::string* name : {&options.request.output, &options.request.input})
+        if (!name->empty())
+            options.inputs.insert(options.inputs.begin(), std::exchange(*name, {}));
+}
+
 void RequirePrinted() {
     if (!std::cout.flush() || std::fflush(stdout) != 0 || std::ferror(stdout) != 0)
         throw Failure(Category::kOutput,
@@ -109,6 +116,8 @@ std::optional<Options> ParseOptions(int argc, char** argv) {
     }
     if (options.request.input == "-")
         options.request.input = kStandardInput;
+    if (options.into)
+        TakeInputs(options);
     CheckOptions(options);
     if (NeedsOutput(options.task))
         ApplyPreset(options);

@@ -30,7 +30,7 @@ struct Options {
     int piece = 0;                    ///< The number of the one to make.
     std::optional<int> jobs;          ///< Pieces at once; 0: as many as pay.
     std::optional<std::string> into;  ///< The folder for many movies.
-    std::vector<std::string> further; ///< Movies beside INPUT and OUTPUT, which is one, too, then.
+    std::vector<std::string> inputs;  ///< What is converted into it; the request names none, then.
     std::optional<std::string> names; ///< The pattern of their outputs' names.
     bool resume = false;
     bool keepPieces = false;

@@ -4,6 +4,7 @@
 #include "host/pieces/Batch.h"
 #include "host/pieces/ClipRun.h"
 #include "host/pieces/Foreman.h"
+#include "host/pieces/OutputNames.h"
 
 #include <chrono>
 #include <functional>
@@ -30,12 +31,7 @@ std::unique_ptr<Work> MakeWork(const Options& options, Observer& observer, Loop 
         order.jobs = options.jobs.value_or(1);
         if (options.names)
             order.names = *options.names;
-        order.inputs = options.further;
-        for (const std::string* name : {&options.request.output, &options.request.input})
-            if (!name->empty())
-                order.inputs.insert(order.inputs.begin(), *name);
-        order.request.input.clear();
-        order.request.output.clear();
+        order.inputs = options.inputs;
         return std::make_unique<Batch>(std::move(order), observer, std::move(loop));
     }
     if (options.task == Task::kConvert && !options.jobs)

@@ -2,10 +2,11 @@
 
 #include "host/convert/Failure.h"
 #include "host/convert/OutputCheck.h"
-#include "host/pieces/BatchJournal.h"
+#include "host/pieces/OutputNames.h"
+#include "host/pieces/PieceRequest.h"
+#include "host/pieces/PlanText.h"
 #include "host/terminal/Preview.h"
 #include "text/FileNames.h"
-#include "text/Path.h"
 
 #include <algorithm>
 #include <fmt/format.h>
@@ -15,26 +16,26 @@
 namespace movieconv {
 namespace {
 
-/// With --into, what stands in the output's place is an input, too.
-bool IsFurtherInput(const std::string& path, const Options& options) {
-    return options.into && (AreSame(path, options.request.output) ||
-                            std::any_of(options.further.begin(), options.further.end(),
-                                        [&](const std::string& input) { return AreSame(path, input); }));
+bool IsOneOfMany(const std::string& path, const Options& options) {
+    return std::any_of(options.inputs.begin(), options.inputs.end(),
+                       [&](const std::string& input) { return AreSame(path, input); });
 }
 
-/// With --into, also before it is there.
-bool IsJournal(const std::string& path, const Options& options) {
-    return options.into && text::NameOf(path) == BatchJournal::kName &&
-           AreSame(text::FolderOf(path), *options.into);
+/// The plan alone tells what a piece, or the joining, reads and makes.
+Written WrittenBy(const Options& options) {
+    if (options.into)
+        return {options.request, {}, *options.into};
+    if (options.task == Task::kPiece || options.task == Task::kJoin)
+        return {WholeRequest(ReadPlan(options.request.input)), options.request.input, {}};
+    return {options.request, options.jobs ? PlanPathFor(options.request.output) : std::string(), {}};
 }
 
 void CheckSideFile(const char* option, const std::string& path, const Options& options) {
-    const Request& request = options.request;
-    const char* other = IsFurtherInput(path, options) ? "the source itself" : WhatIsReadFrom(path, request);
-    if (other == nullptr && !request.output.empty() && IsOutput(path, request))
-        other = "the output or a part of it";
-    if (IsJournal(path, options))
-        other = "the journal of what is converted into that folder";
+    const Written written = WrittenBy(options);
+    const bool isRead = IsOneOfMany(path, options);
+    const char* other = isRead ? "the source itself" : WhatIsReadFrom(path, written.request);
+    if (other == nullptr)
+        other = RoleAmongOutputs(path, written);
     if (other != nullptr) {
         throw Failure(Category::kRequest,
                       fmt::format("{} \"{}\" is {}; give it another name", option, path, other));

@@ -6,8 +6,8 @@
 
 namespace movieconv {
 
-/// Throws Failure when the log or the preview would be written over the source, the output, a clip of it or
-/// its temporary file, or over each other, or the preview over what is no preview.
+/// Throws Failure when the log or the preview would be written over what the program reads, or over
+/// what else it writes, or over each other, or the preview over what is no preview.
 void CheckSideFiles(const Options& options);
 
 } // namespace movieconv

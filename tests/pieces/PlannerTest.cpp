@@ -1,6 +1,6 @@
 // What a plan is made of: the source as it was when planning began.
+#include "host/pieces/Planner.h"
 #include "host/convert/Failure.h"
-#include "host/pieces/Plan.h"
 #include "tests/support/Folder.h"
 #include "tests/support/TestMovies.h"
 

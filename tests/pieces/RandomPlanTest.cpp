@@ -3,6 +3,7 @@
 // once. MOVIECONV_PLANS is the number of the last one, MOVIECONV_FIRST_PLAN that of the first.
 #include "host/convert/Formats.h"
 #include "host/pieces/Foreman.h"
+#include "host/pieces/OutputNames.h"
 #include "tests/convert/Listener.h"
 #include "tests/pieces/Packets.h"
 #include "tests/support/Folder.h"

@@ -46,6 +46,8 @@ TEST(Program, RefusesAndLeavesEverythingAsItWas) {
         Make("index-first.mp4", Join(CountedPictures(1), Beeps(1), Args{"-movflags", "+faststart"})));
     WriteFile(folder / "head.mp4", whole.substr(0, whole.find("mdat") + 4)); // opens, but holds nothing
     WriteFile(folder / "body.mp4", whole.substr(whole.find("mdat") - 4));
+    const std::string plan = folder / "planned";
+    ASSERT_EQ(Call({"--plan", plan, source, folder / "later.mkv"}).code, 0);
     const std::vector<std::string> before = folder.Names();
     const struct {
         Args arguments;
@@ -70,6 +72,17 @@ TEST(Program, RefusesAndLeavesEverythingAsItWas) {
         {{"--plan", folder / "p", source, folder / "there.mp4"}, 4, "--overwrite"},
         {{"--plan", folder / "p", source, folder / "nowhere/out.mp4"}, 4, "nowhere"},
         {{"--plan", folder / "p", "-", folder / "out.mp4"}, 2, "standard input"},
+        {{source, folder / "o.mkv", "--jobs", "1", "--log", folder / "o.mkv.plan"}, 2, "is the plan"},
+        {{source, folder / "o.mkv", "--jobs", "1", "--log", folder / "o.mkv.plan.lock"}, 2, "what guards it"},
+        {{source, folder / "o.mkv", "--jobs", "1", "--log", folder / "o.mkv.plan.0001.piece"}, 2, "a piece"},
+        {{source, folder / "o.mkv", "--split", "1", "--log", folder / "o.mkv.clips"},
+         2,
+         "list of the output's"},
+        {{source, folder / "o.mkv", "--split", "1", "--preview", folder / "o.mkv.clips"}, 2, "list of"},
+        {{"--piece", "0", plan, "--log", source, "-y"}, 2, "is the source"},
+        {{"--piece", "0", plan, "--log", plan, "-y"}, 2, "is the plan"},
+        {{"--piece", "0", plan, "--log", plan + ".0000.piece"}, 2, "is a piece"},
+        {{"--join", plan, "--log", folder / "later.mkv"}, 2, "is the output"},
         {{"--into", folder / "out", source, folder / "body.mp4", folder / "same.mkv", "--log", source, "-y"},
          2,
          "is the source"},

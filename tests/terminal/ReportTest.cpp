@@ -1,7 +1,10 @@
-#include "host/terminal/JsonReporter.h"
+#include "host/terminal/JsonLine.h"
 #include "host/terminal/TextReporter.h"
 
 #include <gtest/gtest.h>
+
+#include <nlohmann/json.hpp>
+#include <string>
 
 namespace {
 
@@ -27,11 +30,18 @@ TEST(ProgressText, FitsTheTerminalAndNeverRoundsUp) {
     EXPECT_NE(ProgressText(report, 1000).find("disk full, waiting"), std::string::npos);
 }
 
-TEST(JsonString, EscapesWhatJsonDoesNotTake) {
-    EXPECT_EQ(JsonString("a\"b\\c\n\x01"), "\"a\\\"b\\\\c\\u000a\\u0001\"");
-    EXPECT_EQ(JsonString("ф\xff"), "\"ф\xEF\xBF\xBD\"");
-    EXPECT_EQ(JsonString("\x7f\xC2\x9b\xE2\x80\xAE"), // NOLINT(misc-misleading-bidirectional)
-              "\"\\u007f\\u009b\\u202e\"");
+TEST(JsonLine, EscapesWhatJsonAndTerminalsDoNotTake) {
+    const struct {
+        const char* text;
+        const char* escaped;
+    } cases[] = {
+        {"a\"b\\c\n\x01", R"(a\"b\\c\n\u0001)"},
+        {"ф\xff", "ф\xEF\xBF\xBD"},
+        {"\x7f\xC2\x9b\xE2\x80\xAE", R"(\u007f\u009b\u202e)"}, // NOLINT(misc-misleading-bidirectional)
+    };
+    for (const auto& [text, escaped] : cases)
+        EXPECT_EQ(JsonLine("warning", {{"text", text}}),
+                  std::string(R"({"v":1,"event":"warning","text":")") + escaped + "\"}\n");
     EXPECT_EQ(EscapeCommands("{\n \"ф\": \"\xC2\x9b\"}"), "{\n \"ф\": \"\\u009b\"}");
 }
 
