@@ -8,15 +8,14 @@
 #include "host/pieces/PieceFile.h"
 #include "host/pieces/PieceRequest.h"
 #include "host/pieces/PlanChecks.h"
+#include "host/pieces/PlanStore.h"
 #include "host/pieces/PlanText.h"
 #include "host/pieces/Planner.h"
 #include "host/pieces/WholeFile.h"
 #include "host/source/MediaTime.h"
-#include "text/FileNames.h"
 
 #include <algorithm>
 #include <chrono>
-#include <filesystem>
 #include <fmt/format.h>
 #include <fstream>
 #include <memory>
@@ -156,86 +155,24 @@ void Foreman::TellWhatStays() {
 
 /// The plan, made and written where that was asked for; nothing when it was stopped.
 std::optional<Plan> Foreman::Prepare() {
+    const PlanStore store(order_.planPath);
     if (!order_.request)
-        return ReadGivenPlan();
+        return store.Given(order_.only);
     CheckOutput(*order_.request);
-    CheckPlaces();
+    store.CheckPlaces(*order_.request);
     lock_.emplace(order_.planPath);
     Plan begun = BeginPlan(*order_.request, order_.division);
-    if (std::optional<Plan> before = Leftover(begun))
-        return before;
+    PlanStore::Leftover left = store.Take(begun, *order_.request,
+                                          order_.resume    ? IfThere::kResume
+                                          : order_.replace ? IfThere::kReplace
+                                                           : IfThere::kRefuse);
+    leftover_ = left.removed;
+    if (left.plan)
+        return left.plan;
     std::optional<Plan> plan = MakePlan(std::move(begun), [this] { return Stopped(); });
     if (plan)
         WritePlan(order_.planPath, *plan);
     return plan;
-}
-
-Plan Foreman::ReadGivenPlan() const {
-    Plan plan = ReadPlan(order_.planPath);
-    if (order_.only && (*order_.only < 0 || *order_.only >= plan.Pieces()))
-        throw Failure(Category::kRequest, fmt::format("the plan has the pieces 0 to {}, no piece {}",
-                                                      plan.Pieces() - 1, *order_.only));
-    if (order_.only)
-        RequirePlaces(order_.planPath, WholeRequest(plan), order_.only);
-    return plan;
-}
-
-/// Refuses, before the source is read, names that pieces cannot have.
-void Foreman::CheckPlaces() const {
-    const std::string& output = order_.request->output;
-    const std::string longest =
-        NameInTheMaking(PiecePath(order_.planPath, kMostPieces)) + text::PartialSuffix(1);
-    try {
-        CheckName(longest);
-    } catch (const Failure& failure) {
-        throw Failure(failure.Kind(),
-                      fmt::format("the name \"{}\" is too long for a conversion in pieces, whose "
-                                  "files have longer ones; choose a shorter one",
-                                  output));
-    }
-    RequirePlaces(order_.planPath, *order_.request, std::nullopt);
-}
-
-/// The plan of an earlier run that is to be gone on with. Otherwise what is left of one is removed.
-std::optional<Plan> Foreman::Leftover(const Plan& now) {
-    std::error_code unknown;
-    const bool planned = std::filesystem::exists(order_.planPath, unknown);
-    const int pieces = CountPieces(order_.planPath);
-    if (planned && order_.resume) {
-        Plan before = ReadPlan(order_.planPath);
-        if (const std::string difference = Difference(before, now); !difference.empty())
-            throw Failure(Category::kRequest,
-                          fmt::format("\"{}\" is of another conversion: {}", order_.planPath, difference),
-                          Reason::kCannotResume);
-        return before;
-    }
-    if (planned)
-        RequireLeave(now, pieces);
-    if (!order_.resume && (planned || pieces > 0))
-        leftover_ = fmt::format("\"{}\" with {} pieces was left of an earlier run; it is made anew",
-                                order_.planPath, pieces);
-    RemovePieces(order_.planPath, *order_.request);
-    return std::nullopt;
-}
-
-/// Throws Failure when the plan that is there is something else, which must not be lost, or pieces of this
-/// very conversion would be. Nobody has named it, so leave to replace the output is none to replace another
-/// file.
-void Foreman::RequireLeave(const Plan& now, int pieces) const {
-    std::optional<Plan> before;
-    try {
-        before = ReadPlan(order_.planPath);
-    } catch (const Failure& failure) {
-        throw Failure(Category::kOutput,
-                      fmt::format("the plan would replace another file: {}; give the output another name, or "
-                                  "remove that file",
-                                  failure.Text()));
-    }
-    if (pieces > 0 && !order_.replace && Difference(*before, now).empty())
-        throw Failure(Category::kOutput,
-                      fmt::format("{} of {} pieces are left of an earlier run beside \"{}\"", pieces,
-                                  before->Pieces(), order_.planPath),
-                      Reason::kLeftover);
 }
 
 /// The numbers of the pieces that are to be made; the rest first, which takes longest.

@@ -46,10 +46,6 @@ private:
     void Report() override;
 
     std::optional<Plan> Prepare();
-    Plan ReadGivenPlan() const;
-    void CheckPlaces() const;
-    std::optional<Plan> Leftover(const Plan& now);
-    void RequireLeave(const Plan& now, int pieces) const;
     std::deque<int> FindMissing() const;
     std::set<int> TakeLacking();
     void Announce();

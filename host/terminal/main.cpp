@@ -1,31 +1,20 @@
-#include "host/convert/Amounts.h"
-#include "host/convert/OutputCheck.h"
-#include "host/convert/Room.h"
-#include "host/convert/Sources.h"
-#include "host/pieces/PlanText.h"
-#include "host/pieces/Planner.h"
-#include "host/presets/Preset.h"
+#include "host/convert/Failure.h"
 #include "host/terminal/ControlInput.h"
-#include "host/terminal/Describe.h"
-#include "host/terminal/JsonLine.h"
-#include "host/terminal/Listings.h"
 #include "host/terminal/MainLoop.h"
 #include "host/terminal/Options.h"
 #include "host/terminal/Session.h"
 #include "host/terminal/SideFileCheck.h"
 #include "host/terminal/StandardStreams.h"
+#include "host/terminal/Tasks.h"
 #include "text/Printable.h"
 
-#include <cerrno>
 #include <cstdio>
 #include <cstdlib>
-#include <cstring>
 #include <exception>
 #include <fcntl.h>
-#include <fmt/format.h>
 #include <malloc.h>
 #include <new>
-#include <string>
+#include <optional>
 #include <unistd.h>
 
 namespace movieconv {
@@ -68,126 +57,6 @@ void OpenStandardDescriptors() {
     close(descriptor);
 }
 
-/// For what was asked for as a text.
-void PrintWhole(const StandardStreams& streams, const std::string& text) {
-    if (!streams.Print(text)) {
-        throw Failure(Category::kOutput,
-                      fmt::format("cannot write to the standard output: {}", std::strerror(errno)));
-    }
-}
-
-std::string TellNeeded(const Room& room) {
-    return room.needed < 0
-               ? fmt::format("how much {} of output need is unknown: the quality decides, not a rate;\n"
-                             "the conversion tells it after its first ten seconds\n",
-                             FormatTime(room.length, true))
-               : fmt::format("needs about {} for {} of output\n", FormatBytes(room.needed),
-                             FormatTime(room.length, true));
-}
-
-ExitCode Estimate(const Options& options, const StandardStreams& streams) {
-    const Room room = EstimateRoom(options.request);
-    const bool asJson = options.progress == ProgressStyle::kJson;
-    PrintWhole(streams, asJson ? EstimateAsJson(room) : TellNeeded(room));
-    if (room.free < 0) {
-        throw Failure(Category::kOutput,
-                      fmt::format("the output's folder \"{}\" cannot be used", room.folder));
-    }
-    if (!asJson)
-        PrintWhole(streams, fmt::format("{} are free in \"{}\"\n", FormatBytes(room.free),
-                                        text::Printable(room.folder)));
-    return room.needed <= room.free ? ExitCode::kDone : ExitCode::kNoSpace;
-}
-
-/// The plan of that name, of the same conversion; nothing when there is none. Throws Failure when it is of
-/// another one.
-std::optional<Plan> PlanThere(const std::string& path, const Plan& begun) {
-    if (access(path.c_str(), F_OK) != 0)
-        return std::nullopt;
-    const auto refuse = [&](const std::string& why) {
-        return Failure(Category::kOutput, fmt::format("\"{}\" exists{}", path, why), Reason::kExists);
-    };
-    std::optional<Plan> there;
-    try {
-        there = ReadPlan(path);
-    } catch (const Failure&) {
-        throw refuse(", and is no whole plan");
-    }
-    if (const std::string difference = Difference(*there, begun); !difference.empty())
-        throw refuse(" and is of another conversion: " + difference);
-    return there;
-}
-
-ExitCode WriteNewPlan(const Options& options, const StandardStreams& streams) {
-    const std::string& path = *options.plan;
-    if (options.request.input == kStandardInput)
-        throw Failure(Category::kRequest, "whoever makes the pieces cannot read this standard input");
-    CheckOutput(options.request); // before all is made that cannot be joined
-    Plan begun = BeginPlan(options.request, options.division);
-    std::optional<Plan> plan = options.request.overwrite ? std::nullopt : PlanThere(path, begun);
-    if (!plan) {
-        plan = MakePlan(std::move(begun), [] { return false; });
-        WritePlan(path, *plan);
-    }
-    if (options.quiet)
-        return ExitCode::kDone;
-    for (const std::string& complaint : options.complaints)
-        streams.PrintError(fmt::format("movieconv: warning: {}", complaint));
-    if (const std::string cost = TellBitRate(*plan); !cost.empty())
-        streams.PrintError(fmt::format("movieconv: warning: {}", cost));
-    PrintWhole(streams,
-               options.progress == ProgressStyle::kJson
-                   ? PlanAsJson(path, plan->Pieces())
-                   : fmt::format("{}: pieces 0 to {}, the last one is the sound and whatever else is "
-                                 "carried\n",
-                                 text::Printable(path), plan->Pieces() - 1));
-    return ExitCode::kDone;
-}
-
-/// Its text; what is odd about it goes to standard error.
-std::string ShowPreset(const std::string& name, const StandardStreams& streams) {
-    try {
-        const Preset preset = LoadPreset(name);
-        for (const std::string& complaint : preset.complaints)
-            streams.PrintError(fmt::format("movieconv: warning: {}", complaint));
-        return EscapeCommands(preset.text);
-    } catch (const PresetError& error) {
-        throw Failure(Category::kRequest, error.what());
-    }
-}
-
-ExitCode Perform(const Options& options, const StandardStreams& streams, MainLoop& loop,
-                 ControlInput& control) {
-    switch (options.task) {
-    case Task::kListFormats:
-        PrintWhole(streams, options.progress == ProgressStyle::kJson ? FormatsJson() : FormatsText());
-        return ExitCode::kDone;
-    case Task::kListPresets:
-        PrintWhole(streams, options.progress == ProgressStyle::kJson ? PresetsJson()
-                            : options.quiet                          ? PresetNames()
-                                                                     : PresetsText());
-        return ExitCode::kDone;
-    case Task::kShowPreset:
-        PrintWhole(streams, ShowPreset(options.preset, streams) + "\n");
-        return ExitCode::kDone;
-    case Task::kInfo: {
-        const SourceInfo source = LookAtSource(options.request);
-        PrintWhole(streams,
-                   options.progress == ProgressStyle::kJson ? DescribeAsJson(source) : Describe(source));
-        return ExitCode::kDone;
-    }
-    case Task::kEstimate:
-        return Estimate(options, streams);
-    case Task::kPlan:
-        return WriteNewPlan(options, streams);
-    case Task::kConvert:
-    case Task::kPiece:
-    case Task::kJoin:
-        break;
-    }
-    return Session(options, streams, loop, control).Run();
-}
-
 int Main(int argc, char** argv) {
     const std::optional<Options> options = ParseOptions(argc, argv);
     if (!options)
@@ -196,7 +65,8 @@ int Main(int argc, char** argv) {
     MainLoop loop;
     ControlInput control(loop);
     const StandardStreams streams(options->log, options->request.overwrite);
-    return static_cast<int>(Perform(*options, streams, loop, control));
+    const std::optional<ExitCode> done = DoWithoutConverting(*options, streams);
+    return static_cast<int>(done ? *done : Session(*options, streams, loop, control).Run());
 }
 
 void Tell(const Failure& failure) {
