@@ -99,8 +99,7 @@ std::string Zsh(const std::vector<OptionEntry>& options) {
     for (const OptionEntry& option : options) {
         const std::vector<std::string> names = Names(option);
         const std::string rest = "[" + Escape(option.help, "[]\\:") + "]" + ZshValue(option);
-        const std::string mentions =
-            option.repeatable ? "*" : fmt::format("({})", fmt::join(names, " "));
+        const std::string mentions = option.repeatable ? "*" : fmt::format("({})", fmt::join(names, " "));
         for (const std::string& name : names)
             fmt::format_to(std::back_inserter(specs), "    {} \\\n", Quoted(mentions + name + rest));
     }
