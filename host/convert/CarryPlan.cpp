@@ -158,7 +158,11 @@ std::optional<NotCarried> CarryPlan::LostCoverTitle() const {
     if (cover == source_.streams.end() || cover->title.empty() || request_.noMetadata ||
         !Has(format_, kWriterFormatCover) || Has(format_, kWriterFormatCoverText))
         return std::nullopt;
-    return NotCarried{"label", cover->index, cover->codec, {}, CannotHold(format_, "its title")};
+    return NotCarried{"label",
+                      cover->index,
+                      cover->codec,
+                      {},
+                      fmt::format("{} cannot hold its {}", ShortName(format_), "title")};
 }
 
 std::vector<NotCarried> CarryPlan::LostByFormat() const {
