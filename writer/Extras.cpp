@@ -5,6 +5,7 @@
 
 #include <algorithm>
 #include <array>
+#include <cmath>
 #include <cstddef>
 #include <cstring>
 #include <optional>
@@ -109,17 +110,17 @@ Cover MakeCover(const void* data, int64_t size) {
     return cover;
 }
 
-std::vector<Chapter> ChaptersWithin(const std::vector<Chapter>& chapters, int64_t begin, int64_t length) {
-    std::vector<Chapter> within;
-    for (const Chapter& chapter : chapters) {
+Extras ExtrasWithin(Extras extras, int64_t begin, double seconds) {
+    const int64_t length = std::llround(seconds * kTicksPerSecond);
+    for (const Chapter& chapter : std::exchange(extras.chapters, {})) {
         const int64_t from = std::max<int64_t>(0, chapter.begin - begin);
         const int64_t to = std::min(length, chapter.end - begin);
         if (to - from >= kWriterShortestChapter)
-            within.push_back({from, to, chapter.title});
+            extras.chapters.push_back({from, to, chapter.title});
     }
-    std::stable_sort(within.begin(), within.end(),
+    std::stable_sort(extras.chapters.begin(), extras.chapters.end(),
                      [](const Chapter& one, const Chapter& other) { return one.begin < other.begin; });
-    return within;
+    return extras;
 }
 
 } // namespace writer

@@ -93,9 +93,9 @@ bool AddTrack(Extras& extras, const WriterTrack* track);
 /// A cover with its codec and size; without a codec when it is neither JPEG nor PNG.
 Cover MakeCover(const void* data, int64_t size);
 
-/// The chapters that lie in a file of `length` that begins at `begin` in the source, on the file's timeline,
-/// in their order.
-std::vector<Chapter> ChaptersWithin(const std::vector<Chapter>& chapters, int64_t begin, int64_t length);
+/// What a file of that many seconds carries which begins at `begin` in the source: of the chapters those that
+/// lie in it, on the file's timeline.
+Extras ExtrasWithin(Extras extras, int64_t begin, double seconds);
 
 } // namespace writer
 

@@ -140,44 +140,44 @@ bool IsBt601(AVColorSpace matrix) {
     return matrix == AVCOL_SPC_UNSPECIFIED || matrix == AVCOL_SPC_BT470BG || matrix == AVCOL_SPC_SMPTE170M;
 }
 
-PicturePlan MakePicturePlan(const EncodeParam& param, const VideoFormat& source, const Container& container,
-                            const WriterOptions& options) {
-    PicturePlan plan{};
-    plan.codec = FindPictureCodec(container, param.fccVideo);
-    if (plan.codec == nullptr)
-        throw WriterFailure(kWriterErrorCodec, "The format " + FormatText(param) + " cannot carry video \"" +
-                                                   CodeText(param.fccVideo) + "\".");
-    plan.settings = MakePictureSettings(param, source, *plan.codec, options);
+/// How large the pictures are, of what shape, and in which form the encoder gets them.
+void SetShape(PicturePlan& plan, const EncodeParam& param, const VideoFormat& source,
+              const WriterOptions& options) {
     plan.sourceAspect = {options.nSampleAspectNum, options.nSampleAspectDen};
     if (plan.sourceAspect.num <= 0 || plan.sourceAspect.den <= 0)
         plan.sourceAspect = {1, 1};
-    plan.sourceFullRange = options.bFullRange != 0;
     plan.stretch = param.bResize != 0;
+    plan.toPalette = plan.codec->format == AV_PIX_FMT_PAL8;
     const int width = plan.settings.width;
     const int height = plan.settings.height;
     if (source.nWidth > 0 && source.nHeight > 0)
         plan.settings.sampleAspect =
             FitPicture(source.nWidth, source.nHeight, plan.sourceAspect, width, height, plan.stretch)
                 .sampleAspect;
-    plan.picture = {width, height, 0, 0, plan.settings.format, plan.sourceFullRange};
+    plan.picture.width = width;
+    plan.picture.height = height;
+    plan.picture.format = plan.toPalette ? kPaletteSource : plan.settings.format;
     if (plan.codec->evenSize) {
         plan.picture.padWidth = width % 2;
         plan.picture.padHeight = height % 2;
         plan.settings.width += plan.picture.padWidth;
         plan.settings.height += plan.picture.padHeight;
     }
-    if (plan.codec->format == AV_PIX_FMT_YUVJ420P)
-        plan.picture.fullRange = true;
+}
+
+void SetColours(PicturePlan& plan, const Carriage& carriage, const WriterOptions& options) {
+    plan.sourceFullRange = options.bFullRange != 0;
+    plan.picture.fullRange = plan.sourceFullRange || plan.codec->format == AV_PIX_FMT_YUVJ420P;
+    plan.settings.fullRange = plan.picture.fullRange;
     plan.picture.matrix = plan.picture.sourceMatrix = RgbMatrix(plan.settings);
-    const Carriage& carriage = FindCarriage(container, plan.codec->code);
     if ((plan.codec->isBt601 || carriage.isBt601) && !IsBt601(plan.settings.matrix)) {
         plan.picture.matrix = SWS_CS_ITU601;
         plan.settings.matrix = AVCOL_SPC_BT470BG;
     }
-    plan.toPalette = plan.codec->format == AV_PIX_FMT_PAL8;
-    if (plan.toPalette)
-        plan.picture.format = kPaletteSource;
-    plan.settings.fullRange = plan.picture.fullRange;
+}
+
+void SetTimes(PicturePlan& plan, const Container& container, const Carriage& carriage,
+              const VideoFormat& source, const WriterOptions& options) {
     plan.settings.inOrder = container.kind == ContainerKind::kSteadyRate;
     plan.clock = MakePictureClock(plan.settings.rate, container.kind == ContainerKind::kSteadyRate);
     const double sourceRate = UsableRate(source.dFrameRate);
@@ -192,6 +192,20 @@ PicturePlan MakePicturePlan(const EncodeParam& param, const VideoFormat& source,
     }
     plan.pictureLength =
         std::llround(static_cast<double>(kTicksPerSecond) / (sourceRate > 0.0 ? sourceRate : rate));
+}
+
+PicturePlan MakePicturePlan(const EncodeParam& param, const VideoFormat& source, const Container& container,
+                            const WriterOptions& options) {
+    PicturePlan plan{};
+    plan.codec = FindPictureCodec(container, param.fccVideo);
+    if (plan.codec == nullptr)
+        throw WriterFailure(kWriterErrorCodec, "The format " + FormatText(param) + " cannot carry video \"" +
+                                                   CodeText(param.fccVideo) + "\".");
+    plan.settings = MakePictureSettings(param, source, *plan.codec, options);
+    const Carriage& carriage = FindCarriage(container, plan.codec->code);
+    SetShape(plan, param, source, options);
+    SetColours(plan, carriage, options);
+    SetTimes(plan, container, carriage, source, options);
     return plan;
 }
 

@@ -53,6 +53,21 @@ void FileRecord::SetTemporaryPath(std::string_view path) {
     text::CopyText(status_.szTemporaryPath, path);
 }
 
+void FileRecord::BeginEnd() {
+    Update([](WriterStatus& status) { status.nState = kWriterFileFinishing; });
+    Tell(kWriterEventFinishing);
+}
+
+bool FileRecord::End(int state) {
+    const bool complete = state == kWriterFileComplete;
+    Update([=](WriterStatus& status) {
+        status.nState = state;
+        status.dFinished = complete ? 1.0 : status.dFinished;
+    });
+    Tell(kWriterEventClosed);
+    return complete;
+}
+
 void FileRecord::Tell(int event) const {
     if (options_.pfnListener == nullptr)
         return;

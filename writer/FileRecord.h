@@ -39,6 +39,12 @@ public:
 
     void SetTemporaryPath(std::string_view path);
 
+    /// The close begins.
+    void BeginEnd();
+
+    /// The file is closed, in its last kWriterFile... state; true when it is complete.
+    bool End(int state);
+
     /// Calls the listener with a kWriterEvent.
     void Tell(int event) const;
 

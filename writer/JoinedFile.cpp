@@ -5,7 +5,6 @@
 
 #include <algorithm>
 #include <climits>
-#include <cmath>
 #include <deque>
 #include <exception>
 #include <optional>
@@ -165,9 +164,8 @@ JoinedFile::~JoinedFile() = default;
 void JoinedFile::AddStreams() {
     if (!plan_.pictures)
         throw WriterFailure(kWriterErrorArgument, "Pieces are made of pictures.");
-    pictures_ =
-        std::make_unique<PictureRow>(parts_.pictures, plan_.pictures->clock.ticksPerPicture,
-                                     [this](const PieceTotals& totals) { TakeTotals(totals, false); });
+    pictures_ = std::make_unique<PictureRow>(parts_.pictures, plan_.pictures->clock.ticksPerPicture,
+                                             [this](const PieceTotals& totals) { AddPictures(totals); });
     const auto add = [this](const MuxedStream& stream) {
         part_.Streams().AddStream(stream);
         units_.push_back(stream.unit);
@@ -199,9 +197,10 @@ bool JoinedFile::Write() {
     int state = kWriterFileFailed;
     try {
         Merge();
-        record_->Update([](WriterStatus& status) { status.nState = kWriterFileFinishing; });
-        record_->Tell(kWriterEventFinishing);
-        finisher.SetExtras(FinalExtras());
+        record_->BeginEnd();
+        const WriterStatus status = record_->Snapshot();
+        finisher.SetExtras(ExtrasWithin(*record_->ExtraParts(), parts_.sourceBegin,
+                                        std::max(status.dVideoReceived, status.dAudioReceived)));
         finisher.Finish();
         state = kWriterFileComplete;
     } catch (...) {
@@ -210,12 +209,7 @@ bool JoinedFile::Write() {
             record_->Tell(kWriterEventFailed);
         finisher.Abandon();
     }
-    record_->Update([state](WriterStatus& status) {
-        status.nState = state;
-        status.dFinished = state == kWriterFileComplete ? 1.0 : status.dFinished;
-    });
-    record_->Tell(kWriterEventClosed);
-    return state == kWriterFileComplete;
+    return record_->End(state);
 }
 
 /// Always the packet that is decoded first, of equal ones that of the stream which comes first: so the file
@@ -248,17 +242,19 @@ void JoinedFile::Merge() {
     }
     RestRow rest(parts_.rest, kNoStream);
     rest.Next();
-    TakeTotals(rest.Totals(), true);
+    TakeRest(rest.Totals());
+}
+
+void JoinedFile::AddPictures(const PieceTotals& totals) {
+    record_->Update([&](WriterStatus& status) {
+        status.llPicturesReceived += totals.picturesReceived;
+        status.llPicturesWritten += totals.picturesWritten;
+    });
 }
 
 /// The rest has seen the stamps of all pictures, and so tells how long they are.
-void JoinedFile::TakeTotals(const PieceTotals& totals, bool rest) {
+void JoinedFile::TakeRest(const PieceTotals& totals) {
     record_->Update([&](WriterStatus& status) {
-        if (!rest) {
-            status.llPicturesReceived += totals.picturesReceived;
-            status.llPicturesWritten += totals.picturesWritten;
-            return;
-        }
         status.llSamplesReceived = totals.samplesReceived;
         status.llSamplesWritten = totals.samplesWritten;
         status.dVideoReceived = static_cast<double>(totals.videoReceived) / kTotalsPerSecond;
@@ -266,15 +262,6 @@ void JoinedFile::TakeTotals(const PieceTotals& totals, bool rest) {
         status.nSampleRate = static_cast<int32_t>(totals.sampleRate);
         status.nAudioBitrate = static_cast<int32_t>(totals.audioBitrate);
     });
-}
-
-Extras JoinedFile::FinalExtras() const {
-    Extras extras = *record_->ExtraParts();
-    const WriterStatus status = record_->Snapshot();
-    const double end = std::max(status.dVideoReceived, status.dAudioReceived);
-    extras.chapters =
-        ChaptersWithin(extras.chapters, parts_.sourceBegin, std::llround(end * kTicksPerSecond));
-    return extras;
 }
 
 } // namespace writer

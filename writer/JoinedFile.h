@@ -45,8 +45,8 @@ private:
 
     void AddStreams();
     void Merge();
-    void TakeTotals(const PieceTotals& totals, bool rest);
-    Extras FinalExtras() const;
+    void AddPictures(const PieceTotals& totals);
+    void TakeRest(const PieceTotals& totals);
 
     const FilePlan plan_;
     const std::string target_;

@@ -260,16 +260,9 @@ void MediaFile::CancelStages() {
 }
 
 bool MediaFile::Close() {
-    record_->Update([](WriterStatus& status) { status.nState = kWriterFileFinishing; });
-    record_->Tell(kWriterEventFinishing);
+    record_->BeginEnd();
     DrainStages();
-    const int state = Conclude();
-    record_->Update([state](WriterStatus& status) {
-        status.nState = state;
-        status.dFinished = state == kWriterFileComplete ? 1.0 : status.dFinished;
-    });
-    record_->Tell(kWriterEventClosed);
-    return state == kWriterFileComplete;
+    return record_->End(Conclude());
 }
 
 /// What the file has become: complete, failed or empty.
@@ -294,15 +287,12 @@ int MediaFile::Conclude() {
     return kWriterFileFailed;
 }
 
-/// What the file carries, with the chapters that lie in it, on its own timeline.
 Extras MediaFile::FinalExtras() const {
-    Extras extras = *record_->ExtraParts();
     const WriterStatus status = record_->Snapshot();
     const double end =
         std::max(static_cast<double>(firstPicture_.value_or(0)) / kTicksPerSecond + status.dVideoReceived,
                  status.dAudioReceived);
-    extras.chapters = ChaptersWithin(extras.chapters, SourceBegin(), std::llround(end * kTicksPerSecond));
-    return extras;
+    return ExtrasWithin(*record_->ExtraParts(), SourceBegin(), end);
 }
 
 /// A stream of which nothing was fit to be taken fails the file: it would look complete without it.

@@ -2,6 +2,7 @@
 
 #include "thread/Stall.h"
 #include "writer/MatroskaLanguages.h"
+#include "writer/TextRows.h"
 #include "writer/WriterFailure.h"
 #include "writer/WriterStatus.h"
 
@@ -33,12 +34,6 @@ bool HasPictures(const AVFormatContext& output) {
     return std::any_of(output.streams, output.streams + output.nb_streams, [](const AVStream* stream) {
         return stream->codecpar->codec_type == AVMEDIA_TYPE_VIDEO;
     });
-}
-
-/// Whether a packet only says that no text is shown, as the multiplexer writes some itself.
-bool IsEmptyText(const AVPacket& packet, const AVStream& stream) {
-    constexpr int kNoLetters = 2; // the length of a text
-    return stream.codecpar->codec_id == AV_CODEC_ID_MOV_TEXT && packet.size <= kNoLetters;
 }
 
 /// Whether a packet of sound holds little but its codec's run-up. Where time is a count from 0 on, such a
@@ -192,7 +187,7 @@ void Muxer::Write(AVPacket& packet, int stream) {
     packet_->stream_index = stream;
     const int64_t time = av_rescale_q(packet_->dts, out->time_base, av_get_time_base_q());
     output_->max_interleave_delta = MostApart(packet_->size);
-    const int counted = IsEmptyText(*packet_, *out) ? 0 : 1;
+    const int counted = IsEmptyText(*packet_, out->codecpar->codec_id) ? 0 : 1;
     // A cover never gets a second packet, for which the multiplexer would wait.
     const bool alone = extras_.HasCoverStream() && streams_.size() == 1;
     Check(alone ? av_write_frame(output_.get(), packet_.get())

@@ -5,6 +5,7 @@
 #include "platform/LogRoute.h"
 #include "writer/CueRow.h"
 #include "writer/FileRecord.h"
+#include "writer/TextRows.h"
 #include "writer/WriterFailure.h"
 
 extern "C" {
@@ -113,18 +114,12 @@ public:
     bool Take(const WriterTrackItem& item, int64_t time) override {
         const bool ends = item.llDuration > 0;
         const bool isBefore = ends && time + item.llDuration <= 0;
-        if (isBefore || IsEmptyText(*item.pPacket))
+        if (isBefore || IsEmptyText(*item.pPacket, parameters_->codec_id))
             return true;
         const av::Packet packet = av::CopyOf(*item.pPacket);
         const int64_t begin = std::max<int64_t>(time, 0);
         HandOn(*packet, begin, ends ? time + item.llDuration - begin : 0);
         return true;
-    }
-
-private:
-    bool IsEmptyText(const AVPacket& packet) const {
-        constexpr int kLengthField = 2;
-        return parameters_->codec_id == AV_CODEC_ID_MOV_TEXT && packet.size <= kLengthField;
     }
 };
 

@@ -5,7 +5,7 @@
 namespace writer {
 namespace {
 
-constexpr int64_t kEmptySize = 2;
+constexpr int64_t kEmptySize = 2;                 // the length of a text
 constexpr int64_t kLongestSample = INT32_MAX / 2; // multiplexers take no longer ones
 
 bool IsEmpty(const PlacedPacket& sample) {
@@ -26,6 +26,10 @@ void AddPieces(PlacedPacket sample, int64_t end, std::vector<PlacedPacket>& row)
 }
 
 } // namespace
+
+bool IsEmptyText(const AVPacket& packet, AVCodecID codec) {
+    return codec == AV_CODEC_ID_MOV_TEXT && packet.size <= kEmptySize;
+}
 
 void TextRows::Add(const PlacedPacket& sample) {
     rows_[sample.stream].push_back(sample);

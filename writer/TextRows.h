@@ -2,6 +2,7 @@
 #ifndef MOVIECONV_WRITER_TEXTROWS_H
 #define MOVIECONV_WRITER_TEXTROWS_H
 
+#include "ffmpeg/AvHandles.h"
 #include "writer/FragmentLog.h"
 
 #include <cstdint>
@@ -9,6 +10,9 @@
 #include <vector>
 
 namespace writer {
+
+/// Whether a packet only says that no text is shown, as the multiplexer writes some itself.
+bool IsEmptyText(const AVPacket& packet, AVCodecID codec);
 
 /// While the file grows, its multiplexer ends each text with an empty sample, late, and some lie where the
 /// next text begins. All times are in the unit of the texts, which is one for all of their streams.

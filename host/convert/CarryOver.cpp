@@ -2,6 +2,7 @@
 
 #include "host/convert/CarryPlan.h"
 #include "host/convert/CarryTexts.h"
+#include "host/convert/Formats.h"
 #include "writer/WriterStatus.h"
 
 #include <fmt/format.h>
@@ -18,7 +19,7 @@ std::string CarryStored(const Movie& movie, const StreamInfo& stream, const Requ
                         const FileFormatInfo& format, uint32_t set, bool& hasCover) {
     if (stream.kind != StreamKind::kCover && stream.kind != StreamKind::kAttachment)
         return {};
-    const bool holdsFiles = (MWGetFormatTraits(format.fccFormat) & kWriterFormatAttachments) != 0;
+    const bool holdsFiles = Has(format, kWriterFormatAttachments);
     if (stream.kind == StreamKind::kCover && hasCover && !holdsFiles)
         return "only one cover is carried";
     const std::vector<uint8_t> data = movie.StoredFile(stream.index);

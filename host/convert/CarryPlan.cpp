@@ -32,13 +32,9 @@ bool CanBeHeard(const StreamInfo& stream) {
     return stream.decodable && stream.sound && stream.sound->sampleRate > 0 && stream.sound->channels > 0;
 }
 
-std::string CannotHoldIt(const FileFormatInfo& format) {
-    return fmt::format("{} cannot hold it", ShortName(format));
-}
-
 std::string WhyCoverStays(const StreamInfo& cover, const FileFormatInfo& format) {
-    if ((MWGetFormatTraits(format.fccFormat) & kWriterFormatCover) == 0)
-        return CannotHoldIt(format);
+    if (!Has(format, kWriterFormatCover))
+        return CannotHold(format, "it");
     return format.fccFormat == FourCC("FLAC") && cover.bytes > kLargestCoverInFlac
                ? fmt::format("{} cannot hold one of {} bytes", ShortName(format), cover.bytes)
                : "";
@@ -114,10 +110,8 @@ std::string CarryPlan::WhyItStays(const StreamInfo& stream) const {
                                                                          : "data streams are not converted";
     case StreamKind::kCover:
         return WhyCoverStays(stream, format_);
-    case StreamKind::kAttachment: {
-        const bool holdsFiles = (MWGetFormatTraits(format_.fccFormat) & kWriterFormatAttachments) != 0;
-        return holdsFiles ? "" : CannotHoldIt(format_);
-    }
+    case StreamKind::kAttachment:
+        return Has(format_, kWriterFormatAttachments) ? "" : CannotHold(format_, "it");
     }
     return {};
 }
@@ -125,13 +119,13 @@ std::string CarryPlan::WhyItStays(const StreamInfo& stream) const {
 /// Why a stream of sound beside the engine's stays behind; empty when it does not.
 std::string CarryPlan::WhySoundStays(const StreamInfo& stream) const {
     if (format_.bHasAudio == 0)
-        return CannotHoldIt(format_);
-    if (!HoldsSeveralTracks(format_))
+        return CannotHold(format_, "it");
+    if (!Has(format_, kWriterFormatTracks))
         return fmt::format("{} holds one track of sound, MKV and MP4 hold several", ShortName(format_));
     if (!CanBeHeard(stream))
         return "it cannot be decoded";
     if (request_.copySound && MWCarriesPackets(format_.fccFormat, stream.codec.c_str()) == 0)
-        return fmt::format("{} cannot hold it as it is", ShortName(format_));
+        return CannotHold(format_, "it as it is");
     if (source_.pictures && !BelongsTo(StreamAt(source_, source_.pictures->index).programs, stream))
         return "it belongs to another programme";
     return {};
@@ -158,12 +152,11 @@ void CarryPlan::AddLostChapters(std::vector<NotCarried>& left) const {
 
 /// Of the one cover that is carried.
 std::optional<NotCarried> CarryPlan::LostCoverTitle() const {
-    const uint32_t traits = MWGetFormatTraits(format_.fccFormat);
     const auto cover =
         std::find_if(source_.streams.begin(), source_.streams.end(),
                      [](const StreamInfo& stream) { return stream.kind == StreamKind::kCover; });
     if (cover == source_.streams.end() || cover->title.empty() || request_.noMetadata ||
-        (traits & kWriterFormatCover) == 0 || (traits & kWriterFormatCoverText) != 0)
+        !Has(format_, kWriterFormatCover) || Has(format_, kWriterFormatCoverText))
         return std::nullopt;
     return NotCarried{"label",
                       cover->index,
@@ -200,7 +193,7 @@ std::string WhySubtitlesStay(const StreamInfo& stream, const FileFormatInfo& for
     if (MWCarriesPackets(format.fccFormat, stream.codec.c_str()) != 0)
         return {};
     const bool matroskaCan = MWCarriesPackets(kMatroska, stream.codec.c_str()) != 0;
-    return fmt::format("{} cannot hold them{}", ShortName(format), matroskaCan ? ", MKV can" : "");
+    return CannotHold(format, matroskaCan ? "them, MKV can" : "them");
 }
 
 NotCarried LeftOf(const StreamInfo& stream, std::string reason) {

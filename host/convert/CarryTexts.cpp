@@ -114,11 +114,6 @@ int AddChapters(const SourceInfo& source, uint32_t set) {
     return left;
 }
 
-/// Where chapters are texts about the movie: CHAPTER001, CHAPTER001NAME ...
-bool HoldsChapterTexts(const FileFormatInfo& format) {
-    return (MWGetFormatTraits(format.fccFormat) & kWriterFormatChapterTexts) != 0;
-}
-
 /// AddChapters as texts, of what lies in the one file that the request asks for.
 int AddChapterTexts(const SourceInfo& source, const Request& request, uint32_t set) {
     constexpr int kMost = 999;
@@ -178,8 +173,7 @@ std::optional<NotCarried> LostLabel(const StreamInfo& stream, const Request& req
     if (missing.empty())
         return std::nullopt;
     return NotCarried{"label", stream.index >= 0 ? std::optional(stream.index) : std::nullopt, stream.codec,
-                      stream.language,
-                      fmt::format("{} cannot hold its {}", ShortName(format), Enumerate(missing))};
+                      stream.language, CannotHold(format, "its " + Enumerate(missing))};
 }
 
 void CarryTexts(const SourceInfo& source, const Request& request, const FileFormatInfo& format,
@@ -198,11 +192,7 @@ std::vector<NotCarried> LostTexts(const SourceInfo& source, const Request& reque
         if (!tag.value.empty() && MWCarriesTag(format.fccFormat, tag.key.c_str(), tag.value.c_str()) == 0)
             missing.push_back(tag.key);
     if (!missing.empty())
-        left.push_back({"tags",
-                        std::nullopt,
-                        {},
-                        {},
-                        fmt::format("{} cannot hold {}", ShortName(format), Enumerate(missing))});
+        left.push_back({"tags", std::nullopt, {}, {}, CannotHold(format, Enumerate(missing))});
     for (const auto& [stream, track] : EnginesTracks(source, request, format))
         if (std::optional<NotCarried> lost = LostLabel(*stream, request, format))
             left.push_back(std::move(*lost));
@@ -211,7 +201,8 @@ std::vector<NotCarried> LostTexts(const SourceInfo& source, const Request& reque
 
 int CarryChapters(const SourceInfo& source, const Request& request, const FileFormatInfo& format,
                   uint32_t set) {
-    return HoldsChapterTexts(format) ? AddChapterTexts(source, request, set) : AddChapters(source, set);
+    return Has(format, kWriterFormatChapterTexts) ? AddChapterTexts(source, request, set)
+                                                  : AddChapters(source, set);
 }
 
 int ChaptersOutside(const SourceInfo& source) {
@@ -233,12 +224,10 @@ std::string FurtherChapterTexts(const SourceInfo& source) {
 
 std::optional<NotCarried> WhyChaptersStay(const SourceInfo& source, const Request& request,
                                           const FileFormatInfo& format) {
-    const bool can =
-        (MWGetFormatTraits(format.fccFormat) & kWriterFormatChapters) != 0 || HoldsChapterTexts(format);
-    if (can || source.chapters.empty() || request.noChapters)
+    if (Has(format, kWriterFormatChapters | kWriterFormatChapterTexts) || source.chapters.empty() ||
+        request.noChapters)
         return std::nullopt;
-    return NotCarried{
-        "chapters", std::nullopt, {}, {}, fmt::format("{} cannot hold them", ShortName(format))};
+    return NotCarried{"chapters", std::nullopt, {}, {}, CannotHold(format, "them")};
 }
 
 } // namespace movieconv

@@ -26,7 +26,7 @@ void PutPictures(EncodeParam& param, const FileFormatInfo& format, const Request
     param.bResize = request.fit == Fit::kStretch ? 1 : 0;
     if (plan.frameRate) // no reference to the record's double, which lies on a 4-byte boundary
         param.dFrameRate = *plan.frameRate;
-    else if ((MWGetFormatTraits(format.fccFormat) & kWriterFormatSteadyRate) != 0)
+    else if (Has(format, kWriterFormatSteadyRate))
         param.dFrameRate = std::min(source.peakRate, kHighestFrameRate);
     param.nVideoBitrate = plan.rate.value_or(param.nVideoBitrate);
     param.nVideoMaxBitrate = plan.maxRate.value_or(0);
@@ -60,7 +60,7 @@ void RequireCopyable(const FileFormatInfo& format, const Request& request, const
                                   others.empty() ? "no format can" : others + " can"));
     }
     const double late = sound.begin.value_or(0) - request.begin;
-    if (withPictures && late > kLate && (MWGetFormatTraits(format.fccFormat) & kWriterFormatSteadyRate) != 0)
+    if (withPictures && late > kLate && Has(format, kWriterFormatSteadyRate))
         throw Failure(Category::kRequest,
                       fmt::format("{} cannot begin the sound as it is {:.1f} s behind the pictures; MKV can",
                                   name, late));

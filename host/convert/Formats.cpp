@@ -7,6 +7,7 @@
 
 #include <algorithm>
 #include <cctype>
+#include <fmt/format.h>
 
 namespace movieconv {
 namespace {
@@ -63,8 +64,12 @@ const FileFormatInfo* FindFormatOfFile(std::string_view path) {
     return FindIf([&](const FileFormatInfo& format) { return HasExtension(format, name.substr(dot + 1)); });
 }
 
-bool HoldsSeveralTracks(const FileFormatInfo& format) {
-    return (MWGetFormatTraits(format.fccFormat) & kWriterFormatTracks) != 0;
+bool Has(const FileFormatInfo& format, uint32_t trait) {
+    return (MWGetFormatTraits(format.fccFormat) & trait) != 0;
+}
+
+std::string CannotHold(const FileFormatInfo& format, std::string_view what) {
+    return fmt::format("{} cannot hold {}", ShortName(format), what);
 }
 
 std::optional<uint32_t> ParseCode(std::string_view text) {

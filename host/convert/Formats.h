@@ -20,8 +20,11 @@ const FileFormatInfo* FindFormatOfFile(std::string_view path);
 /// "MP4" of "MP4 (MPEG-4 Part 14)".
 std::string ShortName(const FileFormatInfo& format);
 
-/// Whether files of the format hold several tracks of sound.
-bool HoldsSeveralTracks(const FileFormatInfo& format);
+/// Whether the format has one of the media writer's kWriterFormat...
+bool Has(const FileFormatInfo& format, uint32_t trait);
+
+/// "MP4 cannot hold it"
+std::string CannotHold(const FileFormatInfo& format, std::string_view what);
 
 /// Compares by bytes, ASCII letters in any case.
 bool SameIgnoringCase(std::string_view one, std::string_view other);

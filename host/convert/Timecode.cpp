@@ -112,8 +112,8 @@ std::optional<NotCarried> WhyTimecodeStays(const SourceInfo& source, const Reque
     if (timecode == nullptr)
         return std::nullopt;
     std::string reason;
-    if ((MWGetFormatTraits(format.fccFormat) & kWriterFormatTimecode) == 0)
-        reason = fmt::format("{} cannot hold it", ShortName(format));
+    if (!Has(format, kWriterFormatTimecode))
+        reason = CannotHold(format, "it");
     else if (!HasPictures(source, request))
         reason = "it belongs to the pictures";
     else if (AVTimecode counted{}; !Parse(*timecode, source.pictures->frameRate, counted))

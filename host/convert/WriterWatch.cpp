@@ -1,9 +1,7 @@
 #include "host/convert/WriterWatch.h"
 
-#include "host/convert/CodecPlan.h"
-#include "host/convert/EncodePlan.h"
 #include "host/convert/Room.h"
-#include "host/source/ColourMatrix.h"
+#include "host/convert/WriterPlan.h"
 #include "text/Path.h"
 
 #include <algorithm>
@@ -25,36 +23,6 @@ bool LatestFile(uint32_t set, WriterStatus& status) {
     return MWGetFileStatus(set, MWGetFileCount(set), &status) != 0;
 }
 
-void TellColours(WriterOptions& writer, const PictureStreamInfo& pictures, bool keepsHdr) {
-    constexpr int kBt709 = 1;
-    const bool becomesSdr = IsHdr(pictures) && !keepsHdr;
-    writer.nColorPrimaries = becomesSdr ? kBt709 : pictures.colorPrimaries;
-    writer.nColorTransfer = becomesSdr ? kBt709 : pictures.colorTransfer;
-    writer.nColorMatrix = HandedOutMatrix(pictures, keepsHdr);
-    if (keepsHdr && pictures.masteringDisplay) {
-        const MasteringDisplay& display = *pictures.masteringDisplay;
-        writer.bMasteringDisplay = 1;
-        std::copy_n(display.red, 2, writer.masteringDisplay.dRed);
-        std::copy_n(display.green, 2, writer.masteringDisplay.dGreen);
-        std::copy_n(display.blue, 2, writer.masteringDisplay.dBlue);
-        std::copy_n(display.white, 2, writer.masteringDisplay.dWhite);
-        writer.masteringDisplay.dDarkest = display.darkest;
-        writer.masteringDisplay.dBrightest = display.brightest;
-    }
-    if (keepsHdr && pictures.lightLevel) {
-        writer.nBrightestPixel = pictures.lightLevel->brightestPixel;
-        writer.nBrightestPicture = pictures.lightLevel->brightestPicture;
-    }
-}
-
-void SetPiece(WriterOptions& writer, const PieceCut& piece) {
-    writer.nPiece = piece.pictures ? kWriterPiecePictures : kWriterPieceRest;
-    writer.bPieceContinues = piece.tick ? 1 : 0;
-    writer.llPieceTick = piece.tick.value_or(0);
-    writer.llPieceBegin = piece.begin - piece.origin;
-    writer.llPieceEnd = piece.last ? -1 : piece.end - piece.origin;
-}
-
 } // namespace
 
 FileIdentity IdentityOf(const std::string& path) noexcept {
@@ -64,41 +32,14 @@ FileIdentity IdentityOf(const std::string& path) noexcept {
     return {true, status.st_dev, status.st_ino, status.st_size};
 }
 
-WriterWatch::WriterWatch(const Request& request, const SourceInfo& source, Bell& bell) : bell_(bell) {
-    WriterOptions writer{};
-    if (source.pictures) {
-        writer.nSampleAspectNum = source.pictures->pixelAspect.num;
-        writer.nSampleAspectDen = source.pictures->pixelAspect.den;
-    }
-    if (const FileFormatInfo& format = ChooseFormat(request); source.pictures && format.bHasVideo != 0) {
-        const PicturePlan plan = PlanPictures(request, format, *source.pictures);
-        writer.bQuality = plan.quality ? 1 : 0;
-        writer.dQuality = plan.quality.value_or(0);
-        writer.nSpeed = plan.speed ? static_cast<int32_t>(*plan.speed) : 0;
-        writer.nProfile = plan.profile ? static_cast<int32_t>(*plan.profile) : 0;
-        writer.nDepth = plan.depth;
-        writer.bSteadyRate = plan.steadyRate ? 1 : 0;
-        TellColours(writer, *source.pictures, plan.keepsHdr);
-    }
-    writer.bKeepExisting = request.overwrite ? 0 : 1;
-    writer.bRemovePartial = request.keepPartial ? 0 : 1;
-    writer.nEncoderThreads = request.encoderThreads;
-    writer.bBitExact = request.bitExact ? 1 : 0;
-    writer.bSoundBeside = request.copySound ? 1 : 0;
-    writer.nChannelMask = source.sound ? source.sound->speakers : 0;
-    writer.dFileLength = request.split.value_or(request.length.value_or(0));
-    if (request.piece)
-        SetPiece(writer, *request.piece);
-    writer.pfnListener = OnEvent;
-    writer.pfnFullDisk = request.onFull == OnFull::kWait ? OnFullDisk : nullptr;
-    writer.pContext = this;
-    set_ = MWRegisterOptions(&writer);
-    if (set_ == 0)
-        throw std::bad_alloc();
-}
+WriterWatch::WriterWatch(const Request& request, const SourceInfo& source, Bell& bell)
+    : bell_(bell), set_(Heard(OptionsFor(request, source), request.onFull)) {}
 
-WriterWatch::~WriterWatch() {
-    MWUnregisterOptions(set_);
+WriterOptions WriterWatch::Heard(WriterOptions options, OnFull onFull) {
+    options.pfnListener = OnEvent;
+    options.pfnFullDisk = onFull == OnFull::kWait ? OnFullDisk : nullptr;
+    options.pContext = this;
+    return options;
 }
 
 std::optional<WriterWatch::News> WriterWatch::Take() {
@@ -130,7 +71,7 @@ void WriterWatch::Retry() {
 
 int64_t WriterWatch::Bytes() const {
     const auto status = std::make_unique<WriterStatus>();
-    const bool open = LatestFile(set_, *status) &&
+    const bool open = LatestFile(set_.Number(), *status) &&
                       (status->nState == kWriterFileWriting || status->nState == kWriterFileFinishing);
     return closedBytes_ + (open ? status->llBytesWritten : 0);
 }
@@ -139,7 +80,7 @@ std::optional<std::string> WriterWatch::VanishedFile() const {
     const auto before = std::make_unique<WriterStatus>();
     const auto after = std::make_unique<WriterStatus>();
     const auto isWritten = [this](WriterStatus& status) {
-        return LatestFile(set_, status) && status.nState == kWriterFileWriting &&
+        return LatestFile(set_.Number(), status) && status.nState == kWriterFileWriting &&
                status.szTemporaryPath[0] != '\0';
     };
     // A close may give the file its name in between.
@@ -202,7 +143,7 @@ int64_t WriterWatch::WaitsForRoom() const {
     if (waiting == 0 || asleep_)
         return waiting;
     const auto status = std::make_unique<WriterStatus>();
-    const bool stuck = LatestFile(set_, *status) && status->nError == kWriterErrorNone &&
+    const bool stuck = LatestFile(set_.Number(), *status) && status->nError == kWriterErrorNone &&
                        (status->nState == kWriterFileWriting || status->nState == kWriterFileFinishing) &&
                        status->llBytesWritten <= waitingAt_;
     return stuck ? waiting : 0;

@@ -4,6 +4,7 @@
 
 #include "host/convert/Bell.h"
 #include "host/convert/Request.h"
+#include "host/convert/WriterSet.h"
 #include "host/source/Source.h"
 #include "writer/WriterStatus.h"
 
@@ -40,7 +41,6 @@ public:
 
     /// `bell` is rung whenever there is news.
     WriterWatch(const Request& request, const SourceInfo& source, Bell& bell);
-    ~WriterWatch();
     WriterWatch(const WriterWatch&) = delete;
     WriterWatch& operator=(const WriterWatch&) = delete;
 
@@ -51,7 +51,7 @@ public:
     int64_t WaitsForRoom() const;
 
     /// The number of the set of options, for EncodeParam::nReserved[kWriterSetWord].
-    uint32_t OptionSet() const { return set_; }
+    uint32_t OptionSet() const { return set_.Number(); }
 
     /// The temporary name of the file that is being written when nothing stands there any more, by its own
     /// removal or the folder's.
@@ -70,8 +70,8 @@ private:
     static void OnEvent(void* context, int event, const WriterStatus* status);
     static int OnFullDisk(void* context, const WriterStatus* status);
     int WaitForRoom(const WriterStatus& status);
+    WriterOptions Heard(WriterOptions options, OnFull onFull);
 
-    uint32_t set_ = 0;
     Bell& bell_;
     mutable std::mutex mutex_;
     std::condition_variable changed_;
@@ -83,6 +83,7 @@ private:
     std::atomic<int64_t> waitingAt_{0}; // where in the file
     std::atomic<bool> asleep_{false};   // until the write is tried again
     std::atomic<int64_t> closedBytes_{0};
+    WriterSet set_; // the last, so that the rest is there for as long as events come
 };
 
 } // namespace movieconv

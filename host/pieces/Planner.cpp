@@ -8,6 +8,8 @@
 #include "host/convert/SizePlan.h"
 #include "host/convert/Sources.h"
 #include "host/pieces/PlanChecks.h"
+#include "host/convert/WriterPlan.h"
+#include "host/convert/WriterSet.h"
 #include "host/source/MediaTime.h"
 #include "media/FourCC.h"
 #include "media/MediaWriter.h"
@@ -16,7 +18,6 @@
 #include <algorithm>
 #include <filesystem>
 #include <fmt/format.h>
-#include <new>
 #include <utility>
 
 namespace movieconv {
@@ -138,31 +139,10 @@ EncodeParam ParamFor(const Request& request, Movie& movie) {
     return param;
 }
 
-/// A set of the writer's options that says what decides, beside the parameters, when pictures are shown.
-class TimeOptions {
-public:
-    explicit TimeOptions(bool steadyRate) {
-        WriterOptions options{};
-        options.bSteadyRate = steadyRate ? 1 : 0;
-        number_ = MWRegisterOptions(&options);
-        if (number_ == 0)
-            throw std::bad_alloc();
-    }
-    TimeOptions(const TimeOptions&) = delete;
-    TimeOptions& operator=(const TimeOptions&) = delete;
-    ~TimeOptions() { MWUnregisterOptions(number_); }
-
-    uint32_t Number() const { return number_; }
-
-private:
-    uint32_t number_ = 0;
-};
-
 std::vector<std::optional<int64_t>> TicksBefore(EncodeParam param, const Request& request, Movie& movie,
                                                 const Stamps& stamps) {
-    const PicturePlan plan = PlanPictures(request, ChooseFormat(request), *movie.Info().pictures);
-    const TimeOptions options(plan.steadyRate);
-    param.nReserved[kWriterSetWord] = options.Number();
+    const WriterSet set(OptionsFor(request, movie.Info()));
+    param.nReserved[kWriterSetWord] = set.Number();
     const VideoFormat format = movie.Pictures()->GetVideoInfo()->format;
     std::vector<int64_t> times = stamps.times;
     for (int64_t& time : times)
