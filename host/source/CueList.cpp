@@ -28,6 +28,22 @@ void Add(CueList& list, av::Packet packet, int64_t begin, int64_t duration) {
     list.cues.push_back({begin, isKnown ? begin + duration : begin, std::move(packet)});
 }
 
+/// False for one that begins at `end` or later.
+bool AddUntil(int64_t end, CueList& list, const MovieReader& reader, av::Packet packet) {
+    const AVRational unit = reader.Context()->streams[packet->stream_index]->time_base;
+    const int64_t stamp = StampOf(*packet);
+    if (stamp == AV_NOPTS_VALUE)
+        return true;
+    if (IsPlainText(list.parameters->codec_id))
+        MakeUtf8(*packet);
+    const int64_t begin = reader.MediaTime(stamp, unit);
+    if (begin >= end)
+        return false;
+    const int64_t duration = av_rescale_q(packet->duration, unit, {1, kTicksPerSecond});
+    Add(list, std::move(packet), begin, duration);
+    return true;
+}
+
 void ReadStream(CueList& list, const Source& source, const BurnWish& wish, bool playlists) {
     const int stream = WantedTracks(source.Info().streams, StreamKind::kSubtitles, {{wish.what}}).front();
     MovieReader reader(source.Info().path, playlists, Growth::kRead, source.Reader().Interruptible());
@@ -40,7 +56,7 @@ void ReadStream(CueList& list, const Source& source, const BurnWish& wish, bool 
     CheckDecodable(*found.codecpar, wish);
     list.parameters = av::CopyOf(*found.codecpar);
     reader.Select({stream});
-    PacketClock clock(source.Info(), *context);
+    PacketClock clock(source.Info(), reader);
     reader.SelectBeside(clock.Witnesses());
     if (wish.begin > kFarthest && !source.Info().clockRestarts) {
         const int64_t from = reader.Start() + wish.begin - kFarthest;
@@ -48,23 +64,16 @@ void ReadStream(CueList& list, const Source& source, const BurnWish& wish, bool 
         if (avformat_seek_file(context, -1, INT64_MIN, target, target, 0) < 0 && !reader.Rewind())
             throw TrackError("the subtitles cannot be read ahead of the pictures");
     }
-    for (;;) {
-        av::Packet packet = av::NewPacket();
-        const int result = av_read_frame(context, packet.get());
+    for (bool ended = false; !ended;) {
+        av::Packet read = av::NewPacket();
+        const int result = av_read_frame(context, read.get());
         av::CheckMemory(result);
-        if (result < 0)
-            return;
-        clock.Repair(reader, *packet);
-        const int64_t stamp = StampOf(*packet);
-        if (packet->stream_index != stream || stamp == AV_NOPTS_VALUE)
-            continue;
-        if (IsPlainText(found.codecpar->codec_id))
-            MakeUtf8(*packet);
-        const int64_t begin = reader.MediaTime(stamp, found.time_base);
-        if (begin >= wish.end)
-            return;
-        const int64_t duration = av_rescale_q(packet->duration, found.time_base, {1, kTicksPerSecond});
-        Add(list, std::move(packet), begin, duration);
+        ended = result < 0;
+        if (!ended)
+            clock.Push(std::move(read));
+        while (av::Packet packet = clock.Pop(ended))
+            if (packet->stream_index == stream && !AddUntil(wish.end, list, reader, std::move(packet)))
+                return;
     }
 }
 

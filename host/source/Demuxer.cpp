@@ -20,7 +20,7 @@ Demuxer::Demuxer(Source& source, Failures& failures)
     : source_(source),
       failures_(failures),
       seeker_(source),
-      clock_(source.Info(), *source.Reader().Context()),
+      clock_(source.Info(), source.Reader()),
       late_(source.Info().streams.size()) {
     source_.Reader().SelectBeside(clock_.Witnesses());
     if (const auto& pictures = source.Info().pictures)
@@ -164,8 +164,9 @@ bool Demuxer::AwaitDemand() {
 
 void Demuxer::Run() {
     failures_.Attempt([this] {
-        while (AwaitDemand() && ReadOne()) {
-        }
+        while (AwaitDemand() && ReadOne())
+            GiveOutRepaired(false);
+        GiveOutRepaired(true);
     });
     {
         const std::lock_guard lock(mutex_);
@@ -174,7 +175,7 @@ void Demuxer::Run() {
     changed_.notify_all();
 }
 
-/// Reads one packet and queues it. False at the end, or when nothing more can be read.
+/// Reads one packet. False at the end, or when nothing more can be read.
 bool Demuxer::ReadOne() {
     av::Packet packet = av::NewPacket();
     const int result = av_read_frame(source_.Reader().Context(), packet.get());
@@ -190,27 +191,38 @@ bool Demuxer::ReadOne() {
     failedReads_ = 0;
     if (seeker_.IsBeforeKey(*packet))
         return true;
-    GiveOut(std::move(packet));
+    TakeUp(std::move(packet));
     return true;
 }
 
-/// To all who take its stream, or the one that this stream goes on with.
+/// As one of its stream, or of the one that this stream goes on with.
+void Demuxer::TakeUp(av::Packet packet) {
+    const AVFormatContext& context = *source_.Reader().Context();
+    const int stream = packet->stream_index;
+    if (queues_.IsTaken(stream))
+        late_.See(context, stream);
+    else if (const int replaced = late_.Replaced(context, stream);
+             replaced >= 0 && AreAlike(*context.streams[replaced], *context.streams[stream]))
+        packet->stream_index = replaced;
+    clock_.Push(std::move(packet));
+}
+
+/// What has its final stamps; `all` when nothing more was read.
+void Demuxer::GiveOutRepaired(bool all) {
+    while (av::Packet packet = clock_.Pop(all))
+        GiveOut(std::move(packet));
+}
+
+/// To all who take its stream.
 void Demuxer::GiveOut(av::Packet packet) {
     const AVFormatContext& context = *source_.Reader().Context();
     const int stream = packet->stream_index;
-    const bool isTaken = queues_.IsTaken(stream);
-    if (isTaken)
-        late_.See(context, stream);
-    const int replaced = isTaken ? -1 : late_.Replaced(context, stream);
-    if (replaced >= 0 && AreAlike(*context.streams[replaced], *context.streams[stream]))
-        packet->stream_index = replaced;
-    clock_.Repair(source_.Reader(), *packet);
+    const std::optional<int64_t> end = EndOf(*packet);
     {
-        const std::optional<int64_t> end = EndOf(*packet);
-        const AVRational unit = context.streams[packet->stream_index]->time_base;
         const std::lock_guard lock(mutex_);
-        if (end && !queues_.IsTaken(packet->stream_index))
-            late_.Leave(context, stream, replaced >= 0, source_.Reader().MediaTime(StampOf(*packet), unit),
+        if (end && !queues_.IsTaken(stream))
+            late_.Leave(context, stream, late_.Replaced(context, stream) >= 0,
+                        source_.Reader().MediaTime(StampOf(*packet), context.streams[stream]->time_base),
                         *end);
         if (!queues_.Add(std::move(packet), end))
             return;

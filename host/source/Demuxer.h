@@ -92,6 +92,8 @@ private:
     void AwaitBeside(std::unique_lock<std::mutex>& lock, Queue& queue, int64_t until, Reached reached);
     bool AwaitDemand();
     bool ReadOne();
+    void TakeUp(av::Packet packet);
+    void GiveOutRepaired(bool all);
     void GiveOut(av::Packet packet);
     std::optional<int64_t> EndOf(const AVPacket& packet) const;
 

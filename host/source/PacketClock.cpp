@@ -5,9 +5,12 @@
 
 #include <algorithm>
 #include <cstddef>
+#include <utility>
 
 namespace movieconv {
 namespace {
+
+constexpr AVRational kMediaBase{1, kTicksPerSecond};
 
 /// Whether the clock of such a source may start anew.
 bool MayJump(const AVFormatContext& context) {
@@ -27,26 +30,36 @@ std::vector<int> WitnessesIn(const SourceInfo& info, const AVFormatContext& cont
 
 } // namespace
 
-PacketClock::PacketClock(const SourceInfo& info, const AVFormatContext& context)
-    : witnesses_(WitnessesIn(info, context)) {}
+PacketClock::PacketClock(const SourceInfo& info, const MovieReader& reader)
+    : reader_(reader), witnesses_(WitnessesIn(info, *reader.Context())) {}
 
-void PacketClock::Repair(const MovieReader& reader, AVPacket& packet) {
-    if (!MayJump(*reader.Context()) || packet.dts == AV_NOPTS_VALUE)
-        return;
-    const AVStream* stream = reader.Context()->streams[packet.stream_index];
-    const AVRational mediaBase{1, kTicksPerSecond};
-    constexpr int64_t kLongest = 3600 * kTicksPerSecond; // damaged data can tell anything
-    const int64_t length =
-        std::clamp<int64_t>(av_rescale_q(packet.duration, stream->time_base, mediaBase), 0, kLongest);
-    const int64_t stamp = reader.MediaTime(packet.dts, stream->time_base);
-    const int64_t shift = stream->codecpar->codec_type == AVMEDIA_TYPE_SUBTITLE
-                              ? repair_.Shift()
-                              : repair_.ShiftFor(packet.stream_index, stamp, length);
+void PacketClock::Push(av::Packet packet) {
+    std::optional<ClockRepair::Packet> told;
+    const AVStream* stream = reader_.Context()->streams[packet->stream_index];
+    const AVMediaType kind = stream->codecpar->codec_type;
+    if (MayJump(*reader_.Context()) && packet->dts != AV_NOPTS_VALUE && kind != AVMEDIA_TYPE_SUBTITLE) {
+        constexpr int64_t kLongest = 3600 * kTicksPerSecond; // damaged data can tell anything
+        const int64_t length = av_rescale_q(packet->duration, stream->time_base, kMediaBase);
+        told = {packet->stream_index, kind == AVMEDIA_TYPE_AUDIO,
+                reader_.MediaTime(packet->dts, stream->time_base), std::clamp<int64_t>(length, 0, kLongest)};
+    }
+    repair_.Push(told);
+    waiting_.push_back(std::move(packet));
+}
+
+av::Packet PacketClock::Pop(bool all) {
+    const std::optional<int64_t> shift = repair_.Pop(all);
     jumps_ = repair_.Jumps();
-    const int64_t ticks = av_rescale_q(shift, mediaBase, stream->time_base);
-    packet.dts += ticks;
-    if (packet.pts != AV_NOPTS_VALUE)
-        packet.pts += ticks;
+    if (!shift)
+        return nullptr;
+    av::Packet packet = std::move(waiting_.front());
+    waiting_.pop_front();
+    const int64_t ticks =
+        av_rescale_q(*shift, kMediaBase, reader_.Context()->streams[packet->stream_index]->time_base);
+    for (int64_t* stamp : {&packet->dts, &packet->pts})
+        if (*stamp != AV_NOPTS_VALUE)
+            *stamp += ticks;
+    return packet;
 }
 
 } // namespace movieconv

@@ -2,11 +2,13 @@
 #ifndef MOVIECONV_HOST_SOURCE_PACKETCLOCK_H
 #define MOVIECONV_HOST_SOURCE_PACKETCLOCK_H
 
+#include "ffmpeg/AvHandles.h"
 #include "host/source/ClockRepair.h"
 #include "host/source/MovieReader.h"
 #include "host/source/SourceInfo.h"
 
 #include <atomic>
+#include <deque>
 #include <vector>
 
 namespace movieconv {
@@ -14,21 +16,27 @@ namespace movieconv {
 /// For one reader of the source. What it reads from the start on gets the same stamps as by any other one.
 class PacketClock {
 public:
-    PacketClock(const SourceInfo& info, const AVFormatContext& context);
+    PacketClock(const SourceInfo& info, const MovieReader& reader);
 
     /// The streams by which jumps are found: all pictures and sound on the clock of what is converted, taken
     /// or not. They have to be read; none where no jumps are to be expected.
     const std::vector<int>& Witnesses() const { return witnesses_; }
 
-    /// Shifts the stamps of a packet that `reader` gave, each once, in their order.
-    void Repair(const MovieReader& reader, AVPacket& packet);
+    /// Takes a packet that the reader gave.
+    void Push(av::Packet packet);
+
+    /// The next packet, in the same order, with its stamps put right. Null while that depends on those that
+    /// follow, unless `all` were taken.
+    av::Packet Pop(bool all = false);
 
     /// Jumps that were put right. Any thread.
     int Jumps() const { return jumps_; }
 
 private:
+    const MovieReader& reader_;
     const std::vector<int> witnesses_;
     ClockRepair repair_;
+    std::deque<av::Packet> waiting_;
     std::atomic<int> jumps_{0};
 };
 

@@ -8,8 +8,10 @@
 
 #include <algorithm>
 #include <cmath>
+#include <cstddef>
 #include <cstring>
 #include <optional>
+#include <vector>
 
 extern "C" {
 #include <libavutil/avstring.h>
@@ -42,19 +44,14 @@ double TaggedEnd(const AVStream* stream, double start) {
                : 0;
 }
 
-/// Pictures per second by the container's index, or by the stamps of the first ones; 0 when neither can be
-/// read.
-double CountFrameRate(MovieReader& reader, const SourceInfo& info) {
-    AVStream* stream = reader.Context()->streams[info.pictures->index];
-    if (av_match_name("mov", reader.Context()->iformat->name) != 0 && stream->nb_frames > 1 &&
-        stream->duration > 0) {
-        const double indexed = static_cast<double>(stream->nb_frames) /
-                               (static_cast<double>(stream->duration) * av_q2d(stream->time_base));
-        if (IsAbout(stream->avg_frame_rate, indexed, 0.05))
-            return indexed;
-    }
+bool IsMov(const MovieReader& reader) {
+    return av_match_name("mov", reader.Context()->iformat->name) != 0;
+}
+
+/// The first pictures; an empty stretch where they could not be read once more.
+Stretch ReadPictures(MovieReader& reader, const SourceInfo& info) {
     if (!reader.IsSeekable())
-        return 0;
+        return {};
     AVStream* sound = info.sound ? reader.Context()->streams[info.sound->index] : nullptr;
     if (sound != nullptr)
         sound->discard = AVDISCARD_ALL;
@@ -62,8 +59,46 @@ double CountFrameRate(MovieReader& reader, const SourceInfo& info) {
     if (sound != nullptr)
         sound->discard = AVDISCARD_DEFAULT;
     ReturnToBegin(reader, info);
+    return begin;
+}
+
+/// Pictures per second by the container's index, or by the stamps of the first ones; 0 when neither can be
+/// read.
+double CountFrameRate(MovieReader& reader, const SourceInfo& info) {
+    const AVStream* stream = reader.Context()->streams[info.pictures->index];
+    if (IsMov(reader) && stream->nb_frames > 1 && stream->duration > 0) {
+        const double indexed = static_cast<double>(stream->nb_frames) /
+                               (static_cast<double>(stream->duration) * av_q2d(stream->time_base));
+        if (IsAbout(stream->avg_frame_rate, indexed, 0.05))
+            return indexed;
+    }
+    const Stretch begin = ReadPictures(reader, info);
     return begin.packets > 1 && begin.last > begin.first ? (begin.packets - 1) / (begin.last - begin.first)
                                                          : 0;
+}
+
+/// In seconds: of all pictures where the container has an index of them, else of the first ones.
+std::vector<double> StampsOfPictures(MovieReader& reader, const SourceInfo& info) {
+    AVStream* stream = reader.Context()->streams[info.pictures->index];
+    const int indexed = IsMov(reader) ? avformat_index_get_entries_count(stream) : 0;
+    if (indexed < 2)
+        return ReadPictures(reader, info).stamps;
+    std::vector<double> stamps;
+    for (int i = 0; i < indexed; ++i)
+        stamps.push_back(static_cast<double>(avformat_index_get_entry(stream, i)->timestamp) *
+                         av_q2d(stream->time_base));
+    return stamps;
+}
+
+/// Pictures per second where they follow each other closest; 0 when that cannot be read.
+double MeasurePeakRate(MovieReader& reader, const SourceInfo& info) {
+    std::vector<double> stamps = StampsOfPictures(reader, info);
+    std::sort(stamps.begin(), stamps.end());
+    double peak = 0;
+    for (std::size_t i = 1; i < stamps.size(); ++i)
+        if (const double rate = 1 / (stamps[i] - stamps[i - 1]); rate <= kHighestPeakRate)
+            peak = std::max(peak, rate);
+    return peak;
 }
 
 /// Whether a stream that is not converted may be what makes the movie as long as the container tells.
@@ -115,8 +150,9 @@ void ProbeFrameRate(MovieReader& reader, SourceInfo& info) {
     }
     pictures.peakRate = pictures.frameRate;
     if (IsTold(stream->r_frame_rate) && !pictures.interlaced) { // where it may count fields
-        if (const double peak = av_q2d(stream->r_frame_rate); peak <= kHighestPeakRate)
-            pictures.peakRate = std::max(pictures.peakRate, peak);
+        const double told = av_q2d(stream->r_frame_rate);
+        pictures.peakRate =
+            std::max(pictures.peakRate, told <= kHighestPeakRate ? told : MeasurePeakRate(reader, info));
     }
 }
 

@@ -31,7 +31,9 @@ StampRepair::Stamp StampRepair::Settle(std::optional<int64_t> next) {
     if (!own || falls || jumpsAhead) {
         ++repaired_;
         if (last_) {
-            const int64_t room = nextRises ? (*next - *last_) / 2 : step_;
+            // Stamps that go on rising below the last one are caught up with.
+            const int64_t pace = falls && next && *next > *own ? step_ / 2 : step_;
+            const int64_t room = nextRises ? (*next - *last_) / 2 : pace;
             time = *last_ + std::clamp<int64_t>(room, 1, step_);
         } else if (!own && next) {
             time = *next - step_;

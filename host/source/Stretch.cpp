@@ -35,8 +35,11 @@ Stretch ReadStretch(MovieReader& reader, int counted, int64_t mostBytes, int mos
         }
         const int64_t stamp = StampOf(*packet);
         if (stamp != AV_NOPTS_VALUE) {
-            stretch.first = std::min(stretch.first, ToSeconds(reader.MediaTime(stamp, stream->time_base)));
-            stretch.last = std::max(stretch.last, ToSeconds(reader.MediaTime(stamp, stream->time_base)));
+            const double time = ToSeconds(reader.MediaTime(stamp, stream->time_base));
+            if (packet->stream_index == counted)
+                stretch.stamps.push_back(time);
+            stretch.first = std::min(stretch.first, time);
+            stretch.last = std::max(stretch.last, time);
             stretch.end =
                 std::max(stretch.end, ToSeconds(reader.MediaTime(EndStampOf(*packet), stream->time_base)));
         }

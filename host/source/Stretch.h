@@ -7,6 +7,7 @@
 
 #include <cstdint>
 #include <limits>
+#include <vector>
 
 namespace movieconv {
 
@@ -17,9 +18,10 @@ struct Stretch {
     int64_t reached = 0;
     double first = std::numeric_limits<double>::infinity(); // stamp
     double last = 0;
-    double end = 0;    // of what lasts longest
-    int packets = 0;   // of one stream, pictures if there are any
-    double length = 0; // of these packets
+    double end = 0;             // of what lasts longest
+    int packets = 0;            // of one stream, pictures if there are any
+    double length = 0;          // of these packets
+    std::vector<double> stamps; // likewise
 };
 
 constexpr int64_t kStretchBytes = 2 << 20; ///< Of packets, usually enough.

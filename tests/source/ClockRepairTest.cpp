@@ -4,6 +4,7 @@
 
 #include <gtest/gtest.h>
 
+#include <cstddef>
 #include <utility>
 #include <vector>
 
@@ -12,7 +13,7 @@ namespace {
 using movieconv::ToMediaTime;
 
 struct Packet {
-    int stream;
+    int stream; ///< 0 are pictures, the others sound.
     double stamp;
     double time; ///< At which it belongs.
 };
@@ -27,9 +28,20 @@ class AClock : public testing::TestWithParam<Recording> {};
 
 TEST_P(AClock, GoesOnBehindJumpsAndKeepsGaps) {
     movieconv::ClockRepair clock;
+    std::vector<int64_t> shifts;
+    const auto take = [&](bool all) {
+        while (const auto shift = clock.Pop(all))
+            shifts.push_back(*shift);
+    };
     for (const Packet& packet : GetParam().packets) {
-        const int64_t stamp = ToMediaTime(packet.stamp);
-        EXPECT_EQ(stamp + clock.ShiftFor(packet.stream, stamp, ToMediaTime(1)), ToMediaTime(packet.time))
+        clock.Push({{packet.stream, packet.stream > 0, ToMediaTime(packet.stamp), ToMediaTime(1)}});
+        take(false);
+    }
+    take(true);
+    ASSERT_EQ(shifts.size(), GetParam().packets.size());
+    for (std::size_t i = 0; i < shifts.size(); ++i) {
+        const Packet& packet = GetParam().packets[i];
+        EXPECT_EQ(ToMediaTime(packet.stamp) + shifts[i], ToMediaTime(packet.time))
             << "stream " << packet.stream << " at " << packet.stamp;
     }
     EXPECT_EQ(clock.Jumps(), GetParam().jumps);
@@ -51,6 +63,15 @@ INSTANTIATE_TEST_SUITE_P(
                   {{0, 5, 5}, {1, 5, 5}, {0, 900, 6}, {1, 900, 6}, {0, 906, 12}, {0, 912, 18}, {1, 914, 20}},
                   1},
         Recording{"PicturesThatComeSeldom", {{0, 5, 5}, {1, 5, 5}, {1, 11, 11}, {1, 17, 17}, {0, 17, 17}}, 0},
+        Recording{"ASmallFallOfPicturesAndSoundAndAGap",
+                  {{0, 5, 5}, {1, 5, 5}, {0, 5.7, 6}, {1, 6, 6}, {0, 6.7, 7}, {1, 6.7, 7}, {0, 8, 8.3}},
+                  1},
+        Recording{"ASmallFallOfPicturesAlone",
+                  {{0, 5, 5}, {1, 5, 5}, {0, 5.7, 5.7}, {1, 6, 6}, {0, 6.7, 6.7}, {1, 7, 7}},
+                  0},
+        Recording{"ASmallFallOfSoundAlone",
+                  {{0, 5, 5}, {1, 5, 5}, {2, 5, 5}, {1, 5.7, 5.7}, {2, 5.7, 5.7}, {0, 6, 6}, {1, 6.7, 6.7}},
+                  0},
         Recording{"AloneALongStep", {{0, 5, 5}, {0, 30, 6}, {0, 31, 7}}, 1}),
     [](const auto& info) { return info.param.name; });
 

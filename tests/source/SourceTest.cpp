@@ -150,6 +150,16 @@ TEST(Source, KeepsACountedRateWhenItsLengthIsMeasured) {
     EXPECT_NEAR(Source(path, {}).Info().pictures->frameRate, 25, 0.1);
 }
 
+TEST(Source, MeasuresTheHighestRateWhereTheContainerTellsItsClock) {
+    for (const char* name : {"unsteady.mp4", "unsteady.nut"}) { // with an index of all pictures, and without
+        const std::string path =
+            Make(name, Join(CountedPictures(4), Words("-vf settb=1/90000,setpts='(N/25+0.02*sin(N*1.7))/TB' "
+                                                      "-vsync passthrough -enc_time_base 1/90000 -r 90000 "
+                                                      "-video_track_timescale 90000 -c:v libx264")));
+        EXPECT_NEAR(Source(path, {}).Info().pictures->peakRate, 100.5, 0.2) << name;
+    }
+}
+
 TEST(Demuxer, DoesNotReadOnWhereSoundStaysAway) {
     const Args raw = Join(Lavfi("color=gray:s=320x240:r=25:d=24,format=yuv420p", "sine=d=1:r=44100"),
                           Words("-c:v rawvideo -c:a pcm_s16le"));

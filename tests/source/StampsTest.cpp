@@ -32,7 +32,11 @@ TEST(StampRepair, KeepsRisingStampsAndMendsTheOthers) {
         {{kNoStamp, kStep * 3}, 1, {kStep * 2, kStep * 3}},
         // Equal and falling ones are lifted, and a single wild one is passed over.
         {{0, 0, 2 * kStep}, 1, {0, kStep, 2 * kStep}},
-        {{5 * kStep, kStep, 2 * kStep}, 2, {5 * kStep, 6 * kStep, 7 * kStep}},
+        {{5 * kStep, kStep, 0}, 2, {5 * kStep, 6 * kStep, 7 * kStep}},
+        // Those that go on rising are caught up with.
+        {{2 * kStep, kStep, 2 * kStep, 3 * kStep, 4 * kStep},
+         2,
+         {2 * kStep, 5 * kStep / 2, 11 * kStep / 4, 3 * kStep, 4 * kStep}},
         {{0, 900'000'000, 2 * kStep, 3 * kStep}, 1, {0, kStep, 2 * kStep, 3 * kStep}},
     };
     for (const auto& test : cases) {
