@@ -26,7 +26,7 @@ void ClipRun::Prepare() {
                                   "cannot be told, so clips of it cannot be gone on with",
                                   request_.input));
     if (keeps_)
-        journal_.RequirePlace();
+        TakePlace();
     found_ = journal_.Exists();
     takesOver_ = resume_ && found_;
     if (takesOver_)
@@ -43,6 +43,14 @@ void ClipRun::Prepare() {
             fmt::format("{}, of an earlier run of which \"{}\" tells", failure.Text(), journal_.Path()),
             Reason::kLeftover);
     }
+}
+
+void ClipRun::TakePlace() {
+    Request any = request_;
+    any.overwrite = true;
+    CheckOutput(any); // where no clip can be made nothing is locked
+    lock_.emplace(journal_.Path());
+    journal_.RequirePlace();
 }
 
 /// Clips of the run that broke off are replaced, and nothing else that has come there meanwhile.

@@ -6,6 +6,7 @@
 #include "host/convert/Outlet.h"
 #include "host/convert/Work.h"
 #include "host/pieces/ClipJournal.h"
+#include "host/pieces/FileLock.h"
 
 #include <optional>
 
@@ -26,6 +27,7 @@ public:
 
 private:
     void Prepare();
+    void TakePlace();
     void TakeOver();
     int FirstNumber() const { return request_.firstClip ? request_.firstClip->number : 0; }
 
@@ -43,6 +45,7 @@ private:
     const bool resume_;
     Outlet outlet_;
     ClipJournal journal_;
+    std::optional<PlanLock> lock_;
     bool found_ = false;     // a journal of an earlier run
     bool takesOver_ = false; // that run's clips
     bool isLeft_ = false;    // some are made anew

@@ -211,6 +211,19 @@ TEST(ClipsLeft, MayBeOfASourceThatIsCalledLikeOneOfThem) {
     }
 }
 
+TEST(ClipsLeft, AreMadeByOneRunAtATime) {
+    const Folder folder;
+    const Args make{"--progress", "json", "-y", "--split", "2", ClipSource(), folder / "out.mp4"};
+    Running first(make, false);
+    ASSERT_TRUE(first.WaitFor(R"("event":"clip_opened")"));
+    const Result second = Call(make);
+    EXPECT_EQ(second.code, kCannotWrite);
+    EXPECT_TRUE(Has(second.err, R"(another run is working on ")" + folder.Path() + "/out.mp4.clips"))
+        << second.err;
+    EXPECT_EQ(first.Finish().code, 0);
+    EXPECT_EQ(folder.Names().size(), 10U);
+}
+
 TEST(ClipsLeft, OfAPipeAreNot) {
     const Folder folder;
     const std::string pipe = folder / "pipe.mkv";
