@@ -13,6 +13,7 @@
 #include <algorithm>
 #include <filesystem>
 #include <fmt/format.h>
+#include <map>
 #include <sstream>
 #include <stdexcept>
 #include <string_view>
@@ -25,6 +26,7 @@ namespace {
 constexpr int kClipListVersion = 1;
 constexpr int64_t kLargestClipList = 256 << 20;
 constexpr std::string_view kClipListHead = "{\"version\":"; // with which Header begins
+constexpr const char* kOpened = "opened";
 
 /// By which a finished clip is known again, wherever its folder is now.
 Json MarkOfClip(const std::string& path) {
@@ -35,6 +37,14 @@ Json MarkOfClip(const std::string& path) {
 
 std::string FirstLine(const std::string& text) {
     return text.substr(0, text.find('\n'));
+}
+
+/// BirthOf a clip, on a line that tells nothing else.
+std::optional<std::string> OpenedOn(const std::string& line) {
+    const std::optional<Json> json = ObjectOn(line);
+    if (json && json->size() == 1 && json->contains(kOpened) && json->at(kOpened).is_string())
+        return json->at(kOpened).get<std::string>();
+    return std::nullopt;
 }
 
 bool IsHeader(const std::optional<Json>& line) {
@@ -104,6 +114,10 @@ std::optional<ClipStart> ClipJournal::Leftover() {
     std::optional<ClipStart> next;
     bool follows = true;
     while (std::getline(lines, line)) {
+        if (const std::optional<std::string> opened = OpenedOn(line)) {
+            births_.insert(*opened);
+            continue;
+        }
         const std::optional<Entry> entry = EntryOn(line);
         follows = follows && entry && IsFinished(*entry);
         if (follows) {
@@ -115,6 +129,7 @@ std::optional<ClipStart> ClipJournal::Leftover() {
         if (entry)
             births_.insert(entry->opened);
     }
+    next_ = next ? next->number : 0;
     return next;
 }
 
@@ -125,6 +140,11 @@ bool ClipJournal::IsOurs(const std::string& clip) const {
            });
 }
 
+bool ClipJournal::HasClips() const {
+    const std::map<int, std::string> clips = ClipsOf(request_.output);
+    return std::any_of(clips.begin(), clips.end(), [this](const auto& clip) { return IsOurs(clip.second); });
+}
+
 std::optional<ClipJournal::Entry> ClipJournal::EntryOn(const std::string& line) {
     const std::optional<Json> json = ObjectOn(line);
     try {
@@ -132,7 +152,7 @@ std::optional<ClipJournal::Entry> ClipJournal::EntryOn(const std::string& line) 
             return Entry{NameFromJson(json->at("clip")),
                          json->at("mark"),
                          {json->at("next").get<int>(), json->at("begin").get<int64_t>()},
-                         json->value("opened", "")};
+                         json->value(kOpened, "")};
     } catch (const Json::exception&) { // of another kind
     } catch (const std::invalid_argument&) {
     }
@@ -152,8 +172,14 @@ bool ClipJournal::IsFinished(const Entry& entry) const {
                   Reason::kExists);
 }
 
-void ClipJournal::Begin() {
-    WriteWhole(path_, kept_.empty() ? Header() : kept_);
+/// Clips further on stay known as long as they stand there: this run may be stopped before it replaces them.
+void ClipJournal::Begin(const std::string& opened) {
+    std::string text = kept_.empty() ? Header() : kept_;
+    for (const auto& [number, clip] : ClipsOf(request_.output))
+        if (number >= next_ && IsOurs(clip))
+            text += CheckedLine({{kOpened, BirthOf(clip)}});
+    births_.insert(opened);
+    WriteWhole(path_, text + CheckedLine({{kOpened, opened}}));
 }
 
 void ClipJournal::NoteFinished(const std::string& clip, ClipStart next, const std::string& opened) {
@@ -161,7 +187,7 @@ void ClipJournal::NoteFinished(const std::string& clip, ClipStart next, const st
                                     {"mark", MarkOfClip(clip)},
                                     {"next", next.number},
                                     {"begin", next.begin},
-                                    {"opened", opened}}));
+                                    {kOpened, opened}}));
 }
 
 void ClipJournal::Remove() const {

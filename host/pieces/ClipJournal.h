@@ -34,12 +34,16 @@ public:
     /// replaced, or when it cannot be read.
     std::optional<ClipStart> Leftover();
 
-    /// Writes what is to be gone on with, or begins anew. Throws Failure, as NoteFinished does.
-    void Begin();
+    /// Writes what is to be gone on with, or begins anew; `opened` is BirthOf the first clip to come. Throws
+    /// Failure, as NoteFinished does.
+    void Begin(const std::string& opened);
 
     /// Whether a clip that stands there is of the run that Leftover found, which listed it further on or was
     /// just completing it, and not somebody else's.
     bool IsOurs(const std::string& clip) const;
+
+    /// Whether any such clip is there, of this run or the one that Leftover found.
+    bool HasClips() const;
 
     /// The clip before `next` is finished, in that file; `opened` is BirthOf the next one. Lastingly.
     void NoteFinished(const std::string& clip, ClipStart next, const std::string& opened);
@@ -63,6 +67,7 @@ private:
     const std::string path_;
     // Of the journal that was found:
     std::string kept_;             // the lines up to the clip to go on with
+    int next_ = 0;                 // its number
     std::vector<Entry> further_;   // what else it lists
     std::set<std::string> births_; // of clips that were being written
 };

@@ -26,13 +26,13 @@ void ClipRun::Prepare() {
                                   "cannot be told, so clips of it cannot be gone on with",
                                   request_.input));
     if (keeps_)
-        journal_.RequirePlace();
-    if (resume_)
-        request_.firstClip = journal_.Leftover();
-    worth_ = request_.firstClip.has_value();
-    if (worth_)
+        TakePlace();
+    found_ = journal_.Exists();
+    takesOver_ = resume_ && found_;
+    if (takesOver_)
         TakeOver();
-    isLeft_ = !worth_ && journal_.Exists();
+    worth_ = request_.firstClip.has_value();
+    isLeft_ = found_ && !worth_;
     try {
         CheckOutput(request_);
     } catch (const Failure& failure) {
@@ -45,19 +45,27 @@ void ClipRun::Prepare() {
     }
 }
 
+void ClipRun::TakePlace() {
+    Request any = request_;
+    any.overwrite = true;
+    CheckOutput(any); // where no clip can be made nothing is locked
+    lock_.emplace(journal_.Path());
+    journal_.RequirePlace();
+}
+
 /// Clips of the run that broke off are replaced, and nothing else that has come there meanwhile.
 void ClipRun::TakeOver() {
+    request_.firstClip = journal_.Leftover();
     for (const auto& [number, clip] : ClipsOf(request_.output))
-        if (number >= request_.firstClip->number && !request_.overwrite && !journal_.IsOurs(clip))
+        if (number >= FirstNumber() && !request_.overwrite && !journal_.IsOurs(clip))
             throw Failure(Category::kOutput, fmt::format("\"{}\" exists", clip), Reason::kExists);
     request_.overwrite = true;
 }
 
 void ClipRun::Start() {
-    if (request_.firstClip) { // what the run that broke off left of it
-        const auto number = static_cast<std::size_t>(request_.firstClip->number);
-        const std::string clip = text::ClipName(std::string_view(request_.output), number);
-        RemoveUnfinished(clip, request_);
+    if (takesOver_) { // what the run that broke off left of it
+        const auto number = static_cast<std::size_t>(FirstNumber());
+        RemoveUnfinished(text::ClipName(std::string_view(request_.output), number), request_);
     }
     job_->Start();
 }
@@ -91,13 +99,13 @@ void ClipRun::Started(const struct Start& news) {
 
 /// When a clip is opened, the one before it is finished and under its name.
 void ClipRun::Opened(const OpenedFile& news) {
+    const std::string birth = BirthOf(news.temporaryPath, news.path);
     try {
         if (keeps_ && !begun_) {
-            journal_.Begin();
+            journal_.Begin(birth);
             begun_ = true;
         } else if (keeps_) {
-            journal_.NoteFinished(closed_, {news.number - 1, news.begin},
-                                  BirthOf(news.temporaryPath, news.path));
+            journal_.NoteFinished(closed_, {news.number - 1, news.begin}, birth);
             worth_ = true;
         }
     } catch (const Failure& failure) {
@@ -115,7 +123,8 @@ void ClipRun::Closed(const ClosedFile& news) {
 }
 
 void ClipRun::Ended(const Verdict& news) {
-    if (begun_ && (news.outcome == Outcome::kDone || !worth_))
+    const bool useless = begun_ && !worth_ && !journal_.HasClips();
+    if (news.outcome == Outcome::kDone ? begun_ || found_ : useless)
         journal_.Remove();
     outlet_.Ended(news);
 }

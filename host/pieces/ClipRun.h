@@ -6,6 +6,7 @@
 #include "host/convert/Outlet.h"
 #include "host/convert/Work.h"
 #include "host/pieces/ClipJournal.h"
+#include "host/pieces/FileLock.h"
 
 #include <optional>
 
@@ -26,7 +27,9 @@ public:
 
 private:
     void Prepare();
+    void TakePlace();
     void TakeOver();
+    int FirstNumber() const { return request_.firstClip ? request_.firstClip->number : 0; }
 
     // News of the conversion, on its thread.
     void Started(const struct Start& news) override;
@@ -42,7 +45,10 @@ private:
     const bool resume_;
     Outlet outlet_;
     ClipJournal journal_;
-    bool isLeft_ = false; // something of an earlier run, which is not gone on with
+    std::optional<PlanLock> lock_;
+    bool found_ = false;     // a journal of an earlier run
+    bool takesOver_ = false; // that run's clips
+    bool isLeft_ = false;    // some are made anew
 
     // The conversion's thread's.
     bool keeps_ = false; // a journal

@@ -4,6 +4,7 @@
 #include "host/pieces/OutputNames.h"
 
 #include <cerrno>
+#include <cstring>
 #include <fcntl.h>
 #include <fmt/format.h>
 #include <sys/file.h>
@@ -13,15 +14,32 @@
 namespace movieconv {
 namespace {
 
-// On network file systems a lock takes the right to write.
-constexpr int kLockFlags = O_RDWR | O_CLOEXEC | O_NOFOLLOW | O_NONBLOCK;
+/// On network file systems a lock takes the right to write, which nobody has to another user's file.
+int OpenToLock(const std::string& path, int further) {
+    constexpr int kFlags = O_CLOEXEC | O_NOFOLLOW | O_NONBLOCK;
+    const int descriptor = open(path.c_str(), O_RDWR | kFlags | further, 0666);
+    return descriptor < 0 && errno == EACCES ? open(path.c_str(), O_RDONLY | kFlags) : descriptor;
+}
 
 FileLock::State Lock(int descriptor) {
     if (descriptor < 0)
-        return FileLock::State::kUnknown;
+        return FileLock::State::kRefused;
     if (flock(descriptor, LOCK_EX | LOCK_NB) == 0)
         return FileLock::State::kHeld;
-    return errno == EWOULDBLOCK ? FileLock::State::kElsewhere : FileLock::State::kUnknown;
+    switch (errno) {
+    case EWOULDBLOCK:
+        return FileLock::State::kElsewhere;
+    case ENOLCK:
+    case ENOSYS:
+    case EOPNOTSUPP:
+        return FileLock::State::kUnknown;
+    default:
+        return FileLock::State::kRefused;
+    }
+}
+
+Failure CannotLock(const std::string& path) {
+    return {Category::kOutput, fmt::format("cannot lock \"{}\": {}", path, std::strerror(errno))};
 }
 
 bool IsEmptyFile(const std::string& path) {
@@ -31,8 +49,7 @@ bool IsEmptyFile(const std::string& path) {
 
 } // namespace
 
-FileLock::FileLock(const std::string& path)
-    : file_(open(path.c_str(), kLockFlags)), state_(Lock(file_.Number())) {}
+FileLock::FileLock(const std::string& path) : file_(OpenToLock(path, 0)), state_(Lock(file_.Number())) {}
 
 PlanLock::PlanLock(const std::string& planPath) : path_(LockPathFor(planPath)) {
     while (!Take()) {
@@ -40,19 +57,26 @@ PlanLock::PlanLock(const std::string& planPath) : path_(LockPathFor(planPath)) {
     if (lock_->Result() == FileLock::State::kElsewhere)
         throw Failure(
             Category::kOutput,
-            fmt::format("another run is working on \"{}\" and its pieces; wait until it ends, or give "
-                        "the output another name",
-                        planPath));
+            fmt::format(
+                "another run is working on \"{}\"; wait until it ends, or give the output another name",
+                planPath));
 }
 
 /// False when whoever held it removed it in between: what is held has no name then.
 bool PlanLock::Take() {
-    const text::Descriptor made(open(path_.c_str(), kLockFlags | O_CREAT, 0666));
-    lock_.emplace(path_);
+    const text::Descriptor made(OpenToLock(path_, O_CREAT));
     struct stat before {};
     struct stat now {};
-    return lock_->Result() == FileLock::State::kElsewhere || fstat(made.Number(), &before) != 0 ||
-           (stat(path_.c_str(), &now) == 0 && before.st_dev == now.st_dev && before.st_ino == now.st_ino);
+    if (made.Number() < 0 || fstat(made.Number(), &before) != 0)
+        throw CannotLock(path_);
+    lock_.emplace(path_);
+    const int error = errno;
+    const bool same =
+        lstat(path_.c_str(), &now) == 0 && before.st_dev == now.st_dev && before.st_ino == now.st_ino;
+    errno = error;
+    if (same && lock_->Result() == FileLock::State::kRefused)
+        throw CannotLock(path_);
+    return same || lock_->Result() == FileLock::State::kElsewhere;
 }
 
 /// Others' files of that name are not empty.

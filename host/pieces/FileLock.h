@@ -16,7 +16,8 @@ public:
     enum class State {
         kHeld,
         kElsewhere, ///< Another process holds it, or another FileLock.
-        kUnknown,   ///< There is none, or its file system knows no locks.
+        kUnknown,   ///< Its file system knows no locks.
+        kRefused,   ///< There is none, or it may not be held.
     };
 
     explicit FileLock(const std::string& path);
@@ -27,10 +28,12 @@ private:
     const State state_;
 };
 
-/// The right to work on a plan and its pieces: an empty file beside it, which goes away in the end.
+/// The right to work on a plan and its pieces, or on clips and their list: an empty file beside it, which
+/// goes away in the end.
 class PlanLock {
 public:
-    /// Throws Failure when another run has it. Where there are no locks, everybody gets it.
+    /// Throws Failure when another run has it, or it cannot be had. Where there are no locks, everybody gets
+    /// it.
     explicit PlanLock(const std::string& planPath);
     PlanLock(const PlanLock&) = delete;
     PlanLock& operator=(const PlanLock&) = delete;

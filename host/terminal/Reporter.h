@@ -26,7 +26,7 @@ struct EndReport {
 /// The main thread's. The defaults tell nothing.
 class Reporter : public Observer {
 public:
-    void Warned(const Warning& news) final { Warn(Explain(news), news.input); }
+    void Warned(const Warning& news) override { Warn(Explain(news), news.input); }
     void Ended(const Verdict& verdict) final;
 
     /// `input`: of which of many movies; otherwise empty.

@@ -83,6 +83,13 @@ std::string ProgressText(const Progress& report, int columns) {
     return line;
 }
 
+void QuietReporter::Warned(const Warning& news) {
+    if (news.kind == Warning::Kind::kFailed)
+        Error(Explain(news));
+    else
+        Reporter::Warned(news);
+}
+
 void QuietReporter::Error(const std::string& text) {
     streams_.PrintError(fmt::format("movieconv: error: {}", text));
 }

@@ -12,6 +12,7 @@ namespace movieconv {
 class QuietReporter : public Reporter {
 public:
     explicit QuietReporter(const StandardStreams& streams) : streams_(streams) {}
+    void Warned(const Warning& news) override; ///< A movie's failure is an error, among others, too.
     void Error(const std::string& text) override;
 
 protected:

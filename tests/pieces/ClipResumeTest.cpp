@@ -48,7 +48,10 @@ struct Killed {
     }
     int Listed() const {
         const std::string lines = ReadFile(list);
-        return static_cast<int>(std::count(lines.begin(), lines.end(), '\n')) - 1;
+        int finished = 0;
+        for (std::size_t at = 0; (at = lines.find("\"clip\":", at)) != std::string::npos; ++at)
+            ++finished;
+        return finished;
     }
     /// What is there but for the clip that the kill left unfinished, which stays as after any kill.
     std::vector<std::string> Names() const {
@@ -126,6 +129,48 @@ TEST(ClipsLeft, ThatAreMissingOrListedOnADamagedLineAreMadeAgain) {
     }
 }
 
+// A stop completes the clip that is being written, which is then shorter than it should be.
+TEST(ClipsLeft, OfRunsThatWereStoppedAreGoneOnWithHoweverOften) {
+    const struct {
+        const char* clip; // at which the first run is stopped; later ones are at their first clip
+        int stops;
+    } rows[] = {{"_00", 2}, {"_02", 3}};
+    for (const auto& row : rows) {
+        const Folder folder;
+        const std::string output = folder / "out.mp4";
+        Args arguments{"--progress", "json",    "--size", "960x720",    "--length",
+                       "8",          "--split", "2",      ClipSource(), output};
+        for (int stop = 0; stop < row.stops; ++stop) {
+            Running run(arguments, false);
+            EXPECT_TRUE(run.WaitFor(fmt::format(R"("event":"clip_opened".*{})", stop == 0 ? row.clip : "")));
+            EXPECT_TRUE(
+                run.WaitFor(R"("phase":"converting".*"position_s":(0\.[1-9]|[1-9]))")); // there is some
+            run.Signal(SIGTERM);
+            ASSERT_EQ(run.Finish().code, kStopped) << row.clip << ", stop " << stop;
+            ASSERT_TRUE(std::filesystem::exists(output + ".clips")) << row.clip << ", stop " << stop;
+            if (stop == 0)
+                arguments.insert(arguments.begin(), "--resume");
+        }
+        const Result resumed = Call(arguments);
+        EXPECT_EQ(resumed.code, 0) << row.clip << ", " << row.stops << " stops: " << resumed.err;
+        EXPECT_EQ(folder.Names().size(), 4U) << row.clip << ", " << row.stops << " stops";
+    }
+}
+
+// Of clips that are all there it would only be in the way, also when it could not be written to.
+TEST(ClipsLeft, AreListedNoLongerThanTheyHaveTo) {
+    const Killed killed;
+    const Folder folder;
+    const std::string output = folder / (std::string(236, 'o') + ".mp4"); // too long for a list in the making
+    for (const char* leave : {"-y", "--resume"}) {
+        WriteFile(output + ".clips", ReadFile(killed.list));
+        const Result result = Call(Join(killed.options, Args{"-y", leave, ClipSource(), output}));
+        EXPECT_EQ(result.code, 0) << result.err;
+        EXPECT_TRUE(Has(result.out + result.err, "it cannot be gone on with")) << result.out << result.err;
+        EXPECT_EQ(folder.Names().size(), 10U) << leave;
+    }
+}
+
 // Whatever others have put under names that are to come.
 TEST(ClipsLeft, LeaveWhatIsNoneOfThem) {
     const Killed killed;
@@ -164,6 +209,19 @@ TEST(ClipsLeft, MayBeOfASourceThatIsCalledLikeOneOfThem) {
         EXPECT_EQ(Call(Join(arguments, Args{"--resume"})).code, 0);
         EXPECT_TRUE(ReadFile(source) == ReadFile(ClipSource())) << name;
     }
+}
+
+TEST(ClipsLeft, AreMadeByOneRunAtATime) {
+    const Folder folder;
+    const Args make{"--progress", "json", "-y", "--split", "2", ClipSource(), folder / "out.mp4"};
+    Running first(make, false);
+    ASSERT_TRUE(first.WaitFor(R"("event":"clip_opened")"));
+    const Result second = Call(make);
+    EXPECT_EQ(second.code, kCannotWrite);
+    EXPECT_TRUE(Has(second.err, R"(another run is working on ")" + folder.Path() + "/out.mp4.clips"))
+        << second.err;
+    EXPECT_EQ(first.Finish().code, 0);
+    EXPECT_EQ(folder.Names().size(), 10U);
 }
 
 TEST(ClipsLeft, OfAPipeAreNot) {

@@ -84,8 +84,10 @@ TEST(ManyMovies, GoOnWhenOneFailsAndTellTheWorst) {
     const Movies movies;
     std::filesystem::create_directory(movies.out);
     WriteFile(movies.out + "/a.mp4", "precious");
-    const Result result = movies.Convert({movies.folder / "nowhere.mkv"});
+    const Result result = movies.Convert({"-q", movies.folder / "nowhere.mkv"});
     EXPECT_EQ(result.code, 4) << result.err;
+    for (const char* why : {"nowhere.mkv\": No such file", "a.mp4\" exists"})
+        EXPECT_TRUE(Has(result.err, why)) << result.err;
     EXPECT_TRUE(Has(result.err, "2 of 4 movies failed") || Has(result.err, "2 of 5 movies failed"))
         << result.err;
     EXPECT_EQ(ReadFile(movies.out + "/a.mp4"), "precious");
