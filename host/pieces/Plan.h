@@ -65,6 +65,9 @@ struct Plan {
 /// Of the program and of the libraries that decide what is in a piece, by name.
 std::map<std::string, std::string> CurrentVersions();
 
+/// An absolute path without detours to the same file, wherever the program runs.
+std::string AbsolutePath(const std::string& path);
+
 /// Looks at a file. Throws Failure when it cannot be read, or not twice.
 SourceMark MarkOf(const std::string& path);
 
