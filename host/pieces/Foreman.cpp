@@ -198,7 +198,7 @@ void Foreman::CheckPlaces() const {
 /// The plan of an earlier run that is to be gone on with. Otherwise what is left of one is removed.
 std::optional<Plan> Foreman::Leftover(const Plan& now) {
     std::error_code unknown;
-    const bool planned = std::filesystem::exists(order_.planPath, unknown);
+    const bool planned = exists(std::filesystem::symlink_status(order_.planPath, unknown));
     const int pieces = CountPieces(order_.planPath);
     if (planned && order_.resume) {
         Plan before = ReadPlan(order_.planPath);
@@ -350,6 +350,8 @@ bool Foreman::FollowJoining(const Joining& latest) {
     constexpr std::chrono::milliseconds kShortest{100}; // between two reports
     const bool waits = latest.waitsFor > 0;
     const bool waited = joining_ && joining_->waitsFor > 0;
+    if (joining_) // before the first report comes work without waits
+        TickAfterWait();
     TickClock(waits);
     if (Stopped())
         return false;
