@@ -32,7 +32,6 @@ namespace movieconv {
 namespace {
 
 constexpr std::chrono::milliseconds kShortestInterval{100}; // between two reports of progress
-constexpr std::chrono::milliseconds kSuspicious{1500};      // between two ticks: the process was suspended
 constexpr double kLeastLength = 0.0011;                     // seconds: less means all the rest to the engine
 constexpr double kEarlyEnd = 1; // seconds by which a source may fall short of the length asked for
 
@@ -240,8 +239,7 @@ void Course::LookAfterFile() {
 
 void Course::UpdateClock() {
     const WorkClock::Time now = WorkClock::Now();
-    if (now - clock_.Last() > kSuspicious)
-        clock_.Skip(now);
+    clock_.TickAfterWait(now);
     if (paused_ || watch_.WaitsForRoom() > 0)
         clock_.Stand(now);
     else

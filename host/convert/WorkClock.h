@@ -24,6 +24,15 @@ public:
         last_ = now;
     }
 
+    /// Likewise, behind a wait of kTick at most: if that took far longer, the whole process was suspended.
+    void TickAfterWait(Time now) {
+        constexpr std::chrono::milliseconds kSuspicious{1500};
+        if (now - last_ > kSuspicious)
+            Skip(now);
+        else
+            Tick(now);
+    }
+
     /// Leaves out the time since the last Tick: the whole process was suspended.
     void Skip(Time now) { last_ = now; }
 
@@ -36,8 +45,6 @@ public:
         stands_ = false;
     }
 
-    /// When it was told the time last.
-    Time Last() const { return last_; }
     double Seconds() const { return std::chrono::duration<double>(worked_).count(); }
 
 private:

@@ -281,6 +281,7 @@ bool Batch::IsMovie(const Request& request) {
 void Batch::Take(const std::string& input, const Verdict& ending) {
     converted_ += ending.position;
     bytes_ += ending.bytes;
+    files_ += ending.files;
     if (ending.outcome == Outcome::kDone)
         ++done_;
     else if (ending.failure)
@@ -310,7 +311,7 @@ Verdict Batch::Conclude() {
     Verdict verdict;
     verdict.position = converted_;
     verdict.bytes = bytes_;
-    verdict.files = done_;
+    verdict.files = files_;
     verdict.worked = Worked();
     verdict.outcome = failed_ > 0 ? Outcome::kFailed : Stopped() ? Outcome::kStopped : Outcome::kDone;
     if (failed_ > 0) {

@@ -70,6 +70,7 @@ private:
     double converted_ = 0;     // seconds, of movies that are done
     int64_t bytes_ = 0;
     int count_ = 0;
+    int files_ = 0; // stopped movies give some, too
     int done_ = 0;
     int skipped_ = 0;
     int failed_ = 0;

@@ -60,7 +60,8 @@ bool IsHeader(const std::optional<Json>& line) {
 ClipJournal::ClipJournal(const Request& request) : request_(request), path_(ClipListFor(request.output)) {}
 
 bool ClipJournal::Exists() const {
-    return access(path_.c_str(), F_OK) == 0;
+    std::error_code unknown; // a link that leads nowhere is there, too
+    return exists(std::filesystem::symlink_status(path_, unknown));
 }
 
 void ClipJournal::RequirePlace() const {

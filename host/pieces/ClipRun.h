@@ -45,7 +45,7 @@ private:
     const bool resume_;
     Outlet outlet_;
     ClipJournal journal_;
-    std::optional<PlanLock> lock_;
+    std::optional<RunLock> lock_;
     bool found_ = false;     // a journal of an earlier run
     bool takesOver_ = false; // that run's clips
     bool isLeft_ = false;    // some are made anew

@@ -131,7 +131,9 @@ void Crew::WorkOff(int atOnce) {
         if (hands_.empty() && (mood != Mood::kGoesOn || !HasMore()))
             return;
         Report();
+        TickClock(AllWaitForRoom());
         bell_.Wait(paused_ ? std::nullopt : std::optional(WorkClock::kTick));
+        TickAfterWait();
         TakeEnded();
     }
 }
@@ -160,7 +162,13 @@ void Crew::FollowWishes() {
         }
     }
     paused_ = paused_ && !stop_;
-    TickClock();
+    TickClock(AllWaitForRoom());
+}
+
+bool Crew::AllWaitForRoom() const {
+    return !hands_.empty() && std::all_of(hands_.begin(), hands_.end(), [](const auto& hand) {
+        return hand->Latest().phase == Phase::kWaitingForRoom;
+    });
 }
 
 void Crew::TickClock(bool stands) {

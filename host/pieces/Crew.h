@@ -87,6 +87,7 @@ protected:
     double Worked() const { return clock_.Seconds(); }
     /// Unless there is a pause or what is done stands still.
     void TickClock(bool stands = false);
+    void TickAfterWait() { clock_.TickAfterWait(WorkClock::Now()); }
     Bell& Ringer() { return bell_; } ///< Wakes the crew's thread, as Stop does.
 
     /// What the conversions under way have come to together; `length` is that of what they have to do.
@@ -101,6 +102,7 @@ private:
 
     void Run() noexcept;
     void FollowWishes();
+    bool AllWaitForRoom() const;
     void TakeEnded();
 
     Outlet outlet_;

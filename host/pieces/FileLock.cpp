@@ -51,7 +51,7 @@ bool IsEmptyFile(const std::string& path) {
 
 FileLock::FileLock(const std::string& path) : file_(OpenToLock(path, 0)), state_(Lock(file_.Number())) {}
 
-PlanLock::PlanLock(const std::string& planPath) : path_(LockPathFor(planPath)) {
+RunLock::RunLock(const std::string& guarded) : path_(LockPathFor(guarded)) {
     while (!Take()) {
     }
     if (lock_->Result() == FileLock::State::kElsewhere)
@@ -59,11 +59,11 @@ PlanLock::PlanLock(const std::string& planPath) : path_(LockPathFor(planPath)) {
             Category::kOutput,
             fmt::format(
                 "another run is working on \"{}\"; wait until it ends, or give the output another name",
-                planPath));
+                guarded));
 }
 
 /// False when whoever held it removed it in between: what is held has no name then.
-bool PlanLock::Take() {
+bool RunLock::Take() {
     const text::Descriptor made(OpenToLock(path_, O_CREAT));
     struct stat before {};
     struct stat now {};
@@ -80,7 +80,7 @@ bool PlanLock::Take() {
 }
 
 /// Others' files of that name are not empty.
-PlanLock::~PlanLock() {
+RunLock::~RunLock() {
     if (IsEmptyFile(path_))
         unlink(path_.c_str());
 }

@@ -30,14 +30,14 @@ private:
 
 /// The right to work on a plan and its pieces, or on clips and their list: an empty file beside it, which
 /// goes away in the end.
-class PlanLock {
+class RunLock {
 public:
     /// Throws Failure when another run has it, or it cannot be had. Where there are no locks, everybody gets
     /// it.
-    explicit PlanLock(const std::string& planPath);
-    PlanLock(const PlanLock&) = delete;
-    PlanLock& operator=(const PlanLock&) = delete;
-    ~PlanLock();
+    explicit RunLock(const std::string& guarded);
+    RunLock(const RunLock&) = delete;
+    RunLock& operator=(const RunLock&) = delete;
+    ~RunLock();
 
 private:
     bool Take();

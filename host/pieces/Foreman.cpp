@@ -288,6 +288,8 @@ bool Foreman::FollowJoining(const Joining& latest) {
     constexpr std::chrono::milliseconds kShortest{100}; // between two reports
     const bool waits = latest.waitsFor > 0;
     const bool waited = joining_ && joining_->waitsFor > 0;
+    if (joining_) // before the first report comes work without waits
+        TickAfterWait();
     TickClock(waits);
     if (Stopped())
         return false;

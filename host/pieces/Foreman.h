@@ -63,7 +63,7 @@ private:
     std::set<int> lacking_; // pieces that lack pictures, so far
 
     // The foreman's thread's.
-    std::optional<PlanLock> lock_;
+    std::optional<RunLock> lock_;
     std::deque<int> missing_;        // pieces that are to be begun
     std::set<int> fromStart_;        // of these, those for which the source is read from its start
     std::string leftover_;           // what there is to tell of an earlier run

@@ -58,8 +58,9 @@ const char* RoleAmongOutputs(const std::string& path, const Written& written) {
     const std::string& plan = written.planPath;
     if (!output.empty() && IsOutput(path, written.request))
         return "the output or a part of it";
-    if (!output.empty() && written.request.split && IsNamed(path, ClipListFor(output)))
-        return "the list of the output's clips";
+    const std::string list = ClipListFor(output);
+    if (!output.empty() && written.request.split && (IsNamed(path, list) || IsNamed(path, LockPathFor(list))))
+        return "the list of the output's clips, or what guards it";
     if (!plan.empty() && (IsNamed(path, plan) || IsNamed(path, LockPathFor(plan))))
         return "the plan of the output's pieces, or what guards it";
     if (!plan.empty() && IsNamedAsPiece(path, plan))

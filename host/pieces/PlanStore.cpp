@@ -40,7 +40,7 @@ void PlanStore::CheckPlaces(const Request& request) const {
 
 PlanStore::Leftover PlanStore::Take(const Plan& now, const Request& request, IfThere ifThere) const {
     std::error_code unknown;
-    const bool planned = std::filesystem::exists(path_, unknown);
+    const bool planned = exists(std::filesystem::symlink_status(path_, unknown));
     const int pieces = CountPieces(path_);
     const bool resume = ifThere == IfThere::kResume;
     if (planned && resume) {

@@ -199,7 +199,7 @@ Plan BeginPlan(const Request& request, const Division& division) {
     Plan plan;
     plan.versions = CurrentVersions();
     plan.source = MarkOf(request.input);
-    plan.output = std::filesystem::absolute(request.output).lexically_normal().string();
+    plan.output = AbsolutePath(request.output);
     plan.division = division;
     plan.settings = request.maxSize ? FitIntoSize(request, LookAtSource(request)) : request;
     if (const SourceInfo source = request.detectCrop ? LookAtSource(request) : SourceInfo{}; source.pictures)

@@ -33,6 +33,14 @@ std::string EdgeOf(const std::string& path, int descriptor, int64_t offset, int6
 
 } // namespace
 
+/// Behind a link ".." leads elsewhere than the names tell; other links may change, and stay as they are.
+std::string AbsolutePath(const std::string& path) {
+    const std::filesystem::path whole = std::filesystem::absolute(path);
+    if (std::find(whole.begin(), whole.end(), "..") == whole.end())
+        return whole.lexically_normal().string();
+    return (std::filesystem::weakly_canonical(whole.parent_path()) / whole.filename()).string();
+}
+
 SourceMark MarkOf(const std::string& path) {
     const text::Descriptor file(open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK));
     struct stat status {};
@@ -44,7 +52,7 @@ SourceMark MarkOf(const std::string& path) {
                                   "once for every piece",
                                   path));
     SourceMark mark;
-    mark.path = std::filesystem::absolute(path).lexically_normal().string();
+    mark.path = AbsolutePath(path);
     mark.bytes = status.st_size;
     mark.modified = int64_t{status.st_mtim.tv_sec} * kNanoseconds + status.st_mtim.tv_nsec;
     const int64_t edge = std::min(mark.bytes, kEdge);

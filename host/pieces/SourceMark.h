@@ -20,6 +20,9 @@ struct SourceMark {
     bool operator==(const SourceMark&) const = default;
 };
 
+/// An absolute path without detours to the same file, wherever the program runs.
+std::string AbsolutePath(const std::string& path);
+
 /// Looks at a file. Throws Failure when it cannot be read, or not twice.
 SourceMark MarkOf(const std::string& path);
 

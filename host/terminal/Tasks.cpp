@@ -15,9 +15,10 @@
 
 #include <cerrno>
 #include <cstring>
+#include <filesystem>
 #include <fmt/format.h>
 #include <string>
-#include <unistd.h>
+#include <system_error>
 #include <utility>
 
 namespace movieconv {
@@ -57,7 +58,8 @@ ExitCode Estimate(const Options& options, const StandardStreams& streams) {
 /// The plan of that name, of the same conversion; nothing when there is none. Throws Failure when it is of
 /// another one.
 std::optional<Plan> PlanThere(const std::string& path, const Plan& begun) {
-    if (access(path.c_str(), F_OK) != 0)
+    std::error_code unknown;
+    if (!exists(std::filesystem::symlink_status(path, unknown))) // a link that leads nowhere is there, too
         return std::nullopt;
     const auto refuse = [&](const std::string& why) {
         return Failure(Category::kOutput, fmt::format("\"{}\" exists{}", path, why), Reason::kExists);

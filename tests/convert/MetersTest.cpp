@@ -29,7 +29,8 @@ TEST(WorkClock, LeavesPausesAndSuspensionOut) {
     clock.Go(at(70));
     clock.Tick(at(71));
     clock.Skip(at(500));
-    clock.Tick(at(501));
+    clock.TickAfterWait(at(501));
+    clock.TickAfterWait(at(900));
     EXPECT_DOUBLE_EQ(clock.Seconds(), 5);
 }
 

@@ -191,6 +191,15 @@ TEST(ClipsLeft, LeaveWhatIsNoneOfThem) {
         EXPECT_TRUE(Has(result.err, list)) << result.err;
         EXPECT_EQ(ReadFile(list), "precious");
     }
+    for (const Args& makes :
+         {Args{"--split", "5"}, Args{"--jobs", "1"}, Args{"--plan", folder / "out.mp4.plan"}}) {
+        for (const char* name : {"out.mp4.clips", "out.mp4.plan"}) {
+            std::filesystem::remove(folder / name);
+            std::filesystem::create_symlink(folder / "nowhere", folder / name);
+        }
+        const Result result = Call(Join(makes, Args{"-q", ClipSource(), folder / "out.mp4"}));
+        EXPECT_EQ(result.code, kCannotWrite) << makes.front() << ": " << result.err;
+    }
 }
 
 // What a kill has left is removed, but not a movie that is converted.

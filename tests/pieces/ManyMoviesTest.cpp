@@ -5,6 +5,7 @@
 
 #include <gtest/gtest.h>
 
+#include <chrono>
 #include <csignal>
 #include <filesystem>
 #include <map>
@@ -12,6 +13,7 @@
 #include <set>
 #include <string>
 #include <sys/stat.h>
+#include <thread>
 #include <vector>
 
 namespace {
@@ -272,6 +274,28 @@ TEST(ManyMovies, ThatArePlaylistsAreMadeAnew) {
     EXPECT_EQ(again.code, 0) << again.err;
     EXPECT_TRUE(Has(again.err, "is made anew: it was made of a playlist")) << again.err;
     EXPECT_FALSE(ReadFile(folder / "out/list.mp4") == before);
+}
+
+/// What a stop completes takes its name.
+TEST(ManyMovies, AreCountedWhenTheyAreStoppedAndDoNotWorkWhileTheProgramIsSuspended) {
+    constexpr double kSuspended = 3;
+    const Folder folder;
+    const auto begun = std::chrono::steady_clock::now();
+    Running run({"--progress", "json", "--into", folder / "out", Lasting()}, false);
+    ASSERT_TRUE(run.WaitFor(R"("phase":"converting".*"position_s":(0\.[1-9]|[1-9]))"));
+    run.Signal(SIGSTOP);
+    ASSERT_TRUE(run.WaitUntilSuspended());
+    std::this_thread::sleep_for(std::chrono::duration<double>(kSuspended));
+    run.Signal(SIGCONT);
+    run.Signal(SIGTERM);
+    const Result result = run.Finish();
+    const std::chrono::duration<double> whole = std::chrono::steady_clock::now() - begun;
+    EXPECT_EQ(result.code, 6) << result.err;
+    EXPECT_TRUE(Has(result.out, R"("files":1)")) << result.out;
+    std::smatch worked;
+    const std::regex pattern(R"("event":"end".*"worked_s":([0-9.]+))");
+    ASSERT_TRUE(std::regex_search(result.out, worked, pattern)) << result.out;
+    EXPECT_LT(std::stod(worked[1]), whole.count() - kSuspended + 0.1) << result.out;
 }
 
 TEST(ManyMovies, LeaveNothingUnfinishedAfterKills) {

@@ -234,6 +234,18 @@ TEST(Pieces, NeverReplaceAnOutputWithoutLeave) {
     }
 }
 
+TEST(Pieces, AreJoinedWhereTheNameLeadsAlsoBehindALink) {
+    const Folder folder;
+    std::filesystem::create_directories(folder / "archive/deep");
+    std::filesystem::create_directory(folder / "here");
+    std::filesystem::create_symlink("../archive/deep", folder / "here/link");
+    WriteFile(folder / "here/out.mp4", "precious");
+    const Result result = Call({"-q", "-y", "--jobs", "1", Source(), folder / "here/link/../out.mp4"});
+    EXPECT_EQ(result.code, 0) << result.err;
+    EXPECT_EQ(ReadFile(folder / "here/out.mp4"), "precious");
+    EXPECT_EQ(folder.Names("archive"), (std::vector<std::string>{"deep", "out.mp4"}));
+}
+
 // Names that conversions in pieces and clips use for themselves.
 TEST(Pieces, LeaveTheirSourceWhateverItIsCalled) {
     const Folder folder;

@@ -14,12 +14,12 @@
 namespace {
 
 using movieconv::Category;
-using movieconv::PlanLock;
+using movieconv::RunLock;
 
 /// Why nobody gets it; empty when one does.
 std::string Refusal(const std::string& list) {
     try {
-        const PlanLock lock(list);
+        const RunLock lock(list);
         return {};
     } catch (const movieconv::Failure& failure) {
         EXPECT_EQ(failure.Kind(), Category::kOutput);
@@ -27,7 +27,7 @@ std::string Refusal(const std::string& list) {
     }
 }
 
-TEST(RightToWork, IsNotGivenWhereSomethingElseStandsInItsPlace) {
+TEST(RunLock, IsNotGivenWhereSomethingElseStandsInItsPlace) {
     const Folder folder;
     std::filesystem::create_symlink(folder / "nowhere", folder / "link.lock");
     std::filesystem::create_directory(folder / "folder.lock");
@@ -37,11 +37,11 @@ TEST(RightToWork, IsNotGivenWhereSomethingElseStandsInItsPlace) {
 }
 
 // In a shared folder, where the lock may only be read.
-TEST(RightToWork, IsNotGivenWhileAnotherUserHasIt) {
+TEST(RunLock, IsNotGivenWhileAnotherUserHasIt) {
     constexpr uid_t kNobody = 65534;
     const Folder folder;
     chmod(folder.Path().c_str(), 0777);
-    std::optional<PlanLock> held(folder / "list");
+    std::optional<RunLock> held(folder / "list");
     chmod((folder / "list.lock").c_str(), 0644);
     if (seteuid(kNobody) != 0)
         GTEST_SKIP() << "only root can be somebody else";
