@@ -209,8 +209,8 @@ private:
 
     const Container& container_;
     const Carriage& carriage_;
-    std::optional<int64_t> first_;        // where the first packet begins
-    std::optional<int64_t> end_;          // of the last one
+    std::optional<int64_t> first_; // where the first packet begins
+    std::optional<int64_t> end_;   // of the last one
 };
 
 struct SubtitleFree {
