@@ -32,7 +32,7 @@ bool SameIgnoringCase(std::string_view one, std::string_view other);
 /// "H264" from "h264", "AAC " from "aac". Nothing for more than four characters or none.
 std::optional<uint32_t> ParseCode(std::string_view text);
 
-/// A codec's scale of constant quality, where less is better.
+/// A codec's scale of constant quality, where lower is better.
 struct QualityScale {
     double best;
     double worst;

@@ -61,7 +61,7 @@ struct Request {
     std::optional<Size> size;
     Fit fit = Fit::kBorders;
     std::optional<double> frameRate; ///< Pictures per second, up to 200.
-    /// Constant quality on the codec's own scale, less is better, instead of a bit rate.
+    /// Constant quality on the codec's own scale, lower is better, instead of a bit rate.
     std::optional<double> quality;
     std::optional<Speed> speed;
     std::optional<int32_t> videoRate;    ///< Bits per second, instead of a constant quality.

@@ -213,7 +213,8 @@ std::string Batch::OutputFor(const std::string& input, const std::string& extens
     Replace(name, "{name}", fs::path(input).stem().string());
     std::string path = order_.folder + "/" + name;
     if (name.empty() || name.find('/') != std::string::npos || path == JournalIn(order_.folder))
-        throw Failure(Category::kRequest, fmt::format("\"{}\" makes no name of \"{}\"", order_.names, input));
+        throw Failure(Category::kRequest,
+                      fmt::format("--names \"{}\" makes no file name of \"{}\"", order_.names, input));
     return path;
 }
 

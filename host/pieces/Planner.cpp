@@ -46,7 +46,7 @@ std::string Obstacle(const Request& request, const Division& division) {
     if (division.pieces && (*division.pieces < 1 || *division.pieces > kMostPieces))
         return fmt::format("a movie is divided into 1 to {} pieces", kMostPieces);
     if (division.length && *division.length < 0.001)
-        return "a piece is at least 0.001 seconds long";
+        return "a piece (--piece-length) is at least 0.001 seconds long";
     return {};
 }
 

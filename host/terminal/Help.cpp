@@ -65,15 +65,26 @@ std::vector<std::string> SplitAt(const std::string& text, char separator) {
     return parts;
 }
 
+/// Without those in capitals, which stand for something, as LIST does.
+std::vector<std::string> WordsAmong(std::vector<std::string> choices) {
+    const auto stands = [](const std::string& choice) {
+        return std::all_of(choice.begin(), choice.end(),
+                           [](char each) { return each >= 'A' && each <= 'Z'; });
+    };
+    choices.erase(std::remove_if(choices.begin(), choices.end(), stands), choices.end());
+    return choices;
+}
+
 void DescribeValue(const CLI::Option& option, OptionEntry& entry) {
     const std::string type = option.get_type_name();
-    const bool isFile = type.find("FILE") != std::string::npos; // alone, "N|FILE" or "FILE[:LANG]"
+    // Alone, "N|FILE" or "FILE[:LANG]".
+    const bool isFile = type.find("FILE") != std::string::npos || type == "FOLDER";
     entry.value = option.get_items_expected_max() == 0 ? OptionEntry::Value::kNone
                   : isFile                             ? OptionEntry::Value::kFile
                   : type == "PRESET"                   ? OptionEntry::Value::kPreset
                                                        : OptionEntry::Value::kFree;
     if (type.find('|') != std::string::npos && !isFile)
-        entry.choices = SplitAt(type, '|');
+        entry.choices = WordsAmong(SplitAt(type, '|'));
     else if (entry.longName == "format")
         entry.choices = ExtensionNames();
     else if (entry.longName == "video-codec" || entry.longName == "audio-codec")

@@ -50,10 +50,11 @@ void CheckPieces(const Options& options) {
          "--pieces and --piece-length go with --jobs or --plan"},
         {division.pieces && division.length, "--pieces and --piece-length exclude each other"},
         {options.jobs && options.task != Task::kConvert,
-         "--jobs goes with a conversion, not with --plan, --piece or --join"},
+         "--jobs goes with a conversion, not with --plan, --piece, --join or --estimate"},
+        {options.request.split && divides, "--split makes clips, which --jobs and --plan do not"},
         {options.resume && !options.jobs && !options.request.split, "--resume goes with --jobs or --split"},
         {options.keepPieces && ((!options.jobs && options.task != Task::kJoin) || options.into),
-         "--keep-pieces goes with --jobs or --join"},
+         "--keep-pieces goes with --jobs or --join, not with --into"},
         {options.preview && options.task != Task::kConvert, "--preview goes with a conversion"},
         {options.jobs && options.preview, "--jobs converts many places at once and so excludes --preview"},
     });

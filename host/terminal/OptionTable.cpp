@@ -28,7 +28,7 @@ void AddRange(CLI::App& app, Options& options) {
     group.Parsed("--begin", "TIME", ParseTime, request.begin, kTime,
                  "Begin here; TIME is seconds or h:mm:ss.fff");
     group.Parsed("--length", "TIME", ParseTime, request.length, kTime,
-                 "Convert so much; by default all the rest");
+                 "Convert this much; by default to the end");
     group.Parsed("--split", "TIME", ParseTime, request.split, "a time such as 600 or 0:10:00",
                  "Write clips of this length: OUTPUT_00, OUTPUT_01, ...");
     group.Flag("--allow-playlists", request.playlists,
@@ -39,8 +39,9 @@ void AddRange(CLI::App& app, Options& options) {
 void AddEncoding(CLI::App& app, Options& options) {
     OptionGroup group(app, heading::kEncoding);
     Request& request = options.request;
-    group.Value("--preset", "PRESET", options.preset,
-                "What is not told by other options, by name or from a\nJSON file (default standard)");
+    group.Value(
+        "--preset", "PRESET", options.preset,
+        "Settings for all that other options leave open, by name\nor from a JSON file (default standard)");
     group.Parsed("-f,--format", "NAME", ParseFormat, request.format,
                  "a file format; see \"movieconv --list-formats\"",
                  "File format, by code or extension; by default the\noutput's extension tells");
@@ -66,7 +67,7 @@ void AddPictures(CLI::App& app, Options& options) {
     group.Choice<Deinterlace>(
         "--deinterlace", request.deinterlace,
         {{"all", Deinterlace::kAll}, {"auto", Deinterlace::kFlagged}, {"off", Deinterlace::kNone}},
-        "Make pictures progressive that say they are interlaced\n(auto, the default), all or none");
+        "Deinterlace pictures that are marked as interlaced\n(auto, the default), all or none");
     group.Read(
         "--crop", "T:B:L:R", [&request](const std::string& text) { return ReadCrop(text, request); },
         "auto or pixels such as 140:140:0:0",
@@ -75,16 +76,16 @@ void AddPictures(CLI::App& app, Options& options) {
         "--hdr", request.hdr, {{"auto", Hdr::kAuto}, {"keep", Hdr::kKeep}, {"sdr", Hdr::kSdr}},
         "Keep HDR, make SDR of it, or keep it where the codec\nhas 10 bits (auto, the default)");
     group.Choice<int>("--depth", request.depth, {{"8", 8}, {"10", 10}},
-                      "Bits of a colour; by default the source's, as far as\nthe codec has them");
+                      "Bits per sample; by default the source's, as far as\nthe codec has them");
     group.Parsed("--frame-rate", "N", ParseFrameRate, request.frameRate,
                  fmt::format("a frame rate from {} to {}, such as 25 or 30000/1001", kLowestFrameRate,
                              kHighestFrameRate),
                  "Pictures per second, steadily; by default the source's times");
     group.Parsed("--quality", "N", ParseNumber, request.quality, "a number such as 23 or 23.5",
-                 "Constant quality on the codec's scale, less is better;\nby default the preset's");
+                 "Constant quality on the codec's scale, lower is better;\nby default the preset's");
     group.Parsed(
         "--max-size", "BYTES", ParseBytes, request.maxSize, "a size such as 700k, 25M or 4.7G",
-        "The output's greatest size, as 25M: chooses rates, and\na smaller picture where they are low");
+        "Largest size of the output, as 25M: chooses rates, and\na smaller picture where they are low");
     group.Choice<Speed>("--speed", request.speed, SpeedChoices(),
                         "How long the encoder looks for a smaller file", "SPEED");
     AddRate(group, "--video-rate", request.videoRate, "512k or 1.5M",
@@ -117,12 +118,12 @@ void AddPieces(CLI::App& app, Options& options) {
     OptionGroup group(app, heading::kPieces);
     group.Parsed("--jobs", "N", ParseJobs, options.jobs,
                  fmt::format("a number from 1 to {}, or auto", kMostJobs),
-                 "Convert in pieces, N at once; auto: as many as pay");
+                 "Convert in pieces, N at once; auto: as many as help");
     group.Number("--pieces", "N", 1, kMostPieces, options.division.pieces,
                  "Divide into N pieces; by default of a minute or more");
     group.Parsed("--piece-length", "TIME", ParseTime, options.division.length, kTime,
                  "Divide into pieces of this length");
-    group.Flag("--resume", options.resume, "Go on with what the same command has left earlier");
+    group.Flag("--resume", options.resume, "Resume an earlier run of the same command");
     group.Taken<std::string>(
         "--plan", "FILE",
         [&options](const std::string& name) {

@@ -28,7 +28,7 @@ struct Options {
     std::optional<std::string> plan; ///< Where a plan is to be written.
     Division division;
     int piece = 0;                    ///< The number of the one to make.
-    std::optional<int> jobs;          ///< Pieces at once; 0: as many as pay.
+    std::optional<int> jobs;          ///< Pieces at once; 0: as many as help.
     std::optional<std::string> into;  ///< The folder for many movies.
     std::vector<std::string> inputs;  ///< What is converted into it; the request names none, then.
     std::optional<std::string> names; ///< The pattern of their outputs' names.

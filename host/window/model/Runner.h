@@ -44,7 +44,7 @@ struct MovieFacts {
     QString pictureCodec; ///< "H.264".
     bool interlaced = false;
     bool hdr = false;
-    int depth = 8; ///< Bits of a colour.
+    int depth = 8; ///< Bits per sample.
     QString title; ///< As the movie tells it.
     std::vector<TrackFacts> sounds;
     std::vector<TrackFacts> subtitles;

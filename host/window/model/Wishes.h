@@ -63,7 +63,7 @@ struct Wishes {
     bool crop = false;          ///< Cut black borders off.
     std::optional<Margins> cut; ///< Cut that off instead.
     Hdr hdr = Hdr::kAuto;
-    std::optional<int> depth;     ///< Bits of a colour, 8 or 10.
+    std::optional<int> depth;     ///< Bits per sample, 8 or 10.
     bool chapters = true;         ///< Carry them over.
     bool texts = true;            ///< Carry the movie's texts over: title, date and so on.
     std::optional<QString> title; ///< Instead of the movie's own; empty: none.

@@ -62,7 +62,7 @@ constexpr int kUsualHeight = 1080; // for which a preset's place on the window's
 /// The part of a codec's scale that the window's covers.
 struct Scale {
     double centre; // which is 50 in the window
-    double span;   // less is better
+    double span;   // lower is better
     QualityScale whole;
 };
 
