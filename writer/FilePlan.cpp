@@ -299,9 +299,10 @@ int64_t IndexSize(const FilePlan& plan, const VideoFormat* video, const AudioFor
 
 int64_t PicturePlan::StayOf(const VideoImage& image) const {
     const int64_t told = image.nDuration;
-    if (!keepStamps && told > 0) // on the grid a shorter one might not be seen at all
-        return std::max<int64_t>(told,
-                                 std::llround(static_cast<double>(kTicksPerSecond) / av_q2d(settings.rate)));
+    if (!keepStamps && told > 0) { // on the grid a shorter one might not be seen at all
+        const int64_t step = std::llround(static_cast<double>(kTicksPerSecond) / av_q2d(settings.rate));
+        return std::max(told, std::min(step, pictureLength));
+    }
     const bool countsPictures = clock.ticksPerPicture == 1; // and is made longer only where that pays
     return told <= 0 || (countsPictures && told - pictureLength <= kTicksPerSecond) ? pictureLength : told;
 }

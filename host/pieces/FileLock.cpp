@@ -54,7 +54,7 @@ FileLock::FileLock(const std::string& path) : file_(OpenToLock(path, 0)), state_
 RunLock::RunLock(const std::string& guarded) : path_(LockPathFor(guarded)) {
     while (!Take()) {
     }
-    if (lock_->Result() == FileLock::State::kElsewhere)
+    if (lock_ && lock_->Result() == FileLock::State::kElsewhere)
         throw Failure(
             Category::kOutput,
             fmt::format(
@@ -67,6 +67,8 @@ bool RunLock::Take() {
     const text::Descriptor made(OpenToLock(path_, O_CREAT));
     struct stat before {};
     struct stat now {};
+    if (made.Number() < 0 && errno == ENAMETOOLONG) // nor is there a list or plan of such a name
+        return true;
     if (made.Number() < 0 || fstat(made.Number(), &before) != 0)
         throw CannotLock(path_);
     lock_.emplace(path_);

@@ -131,8 +131,8 @@ const Odd kOddities[] = {
     {"short-sound.mkv", Lossless(3, 1), "o.mp4", 75, 3},
     {"long-sound.mkv", Lossless(1, 3), "o.mp4", 25, 3},
     {"still.mkv", kStill, "o.flv", 100, 14},
-    {"variable.mp4", kVariable, "o.avi", 100, 0},
-    {"fast.mkv", kFast, "o.mp4", 240, 0}, // a rate that the engine would bring down to 30
+    {"variable.mp4", kVariable, "o.avi", 99, 0}, // of 3.96 s
+    {"fast.mkv", kFast, "o.mp4", 240, 0},        // a rate that the engine would bring down to 30
     {"milliseconds.avi", kMilliseconds, "o.avi", 25, 0},
     {"plain.mkv", Lossless(2, 2), "o.mkv", 50, 0, {"--no-audio"}},
     {"plain.mkv", Lossless(2, 2), "o.mp3", 0, 2, {"--no-video"}},
