@@ -192,6 +192,21 @@ TEST(Times, OfSilenceBehindTheSoundAreThoseOfLongPictures) {
     EXPECT_GE(std::stod(told), 850);
 }
 
+// A header may announce less than there is.
+TEST(Times, OfALengthBeyondTheEndAreAllThereAre) {
+    std::string content = ReadFile(
+        Make("announces.flv", Join(CountedPictures(4), Join(Beeps(4), Words("-c:v flv1 -c:a libmp3lame")))));
+    const std::string name = "duration";
+    const std::size_t value = content.find(name) + name.size() + 1;
+    ASSERT_LT(value, content.size());
+    content.replace(value, 8, std::string("\x40\0\0\0\0\0\0\0", 8)); // two seconds
+    const Folder folder;
+    const std::string source = folder / "announces-two.flv";
+    WriteFile(source, content);
+    for (const Args& options : {Args{}, Args{"--length", "99"}})
+        EXPECT_EQ(Convert(source, options, "mkv").pictures.size(), 100U);
+}
+
 TEST(Times, OfMpeg2AreThoseOfOneOfItsRates) {
     const std::string source =
         Make("mean-rate.mp4",
