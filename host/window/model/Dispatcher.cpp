@@ -36,7 +36,7 @@ public:
     /// Brought to its size on the run's thread: when the window paints a picture in another size, it waits
     /// for threads that wait for a processor.
     void OnPicture(const QImage& picture) override {
-        const QSize room = *pictureRoom_;
+        const QSize room = pictureRoom_->load().pixels;
         const QImage fitted = picture.isNull() || room.isEmpty()
                                   ? picture
                                   : picture.scaled(room, Qt::KeepAspectRatio, Qt::SmoothTransformation);
@@ -72,7 +72,7 @@ private:
     std::mutex posting_;
     Dispatcher* dispatcher_; // as long as that is not null, it stays while `posting_` is held
     const quint64 id_;
-    const std::shared_ptr<const std::atomic<QSize>> pictureRoom_;
+    const std::shared_ptr<const std::atomic<Dispatcher::PictureRoom>> pictureRoom_;
     std::mutex mutex_; // of what follows
     News news_;
     bool posted_ = false;
@@ -213,7 +213,7 @@ void Dispatcher::ShowPicturesOf(quint64 id) {
 }
 
 void Dispatcher::SetPictureRoom(QSize pixels) {
-    *pictureRoom_ = pixels;
+    *pictureRoom_ = {pixels};
 }
 
 /// Starts what there is room for, unless all that runs is paused; ends the work when nothing is left.

@@ -77,6 +77,10 @@ Q_SIGNALS:
 
 private:
     friend class Mailbox;
+    /// Aligned as a whole: a compiler would otherwise take a lock to read it.
+    struct alignas(sizeof(QSize)) PictureRoom {
+        QSize pixels;
+    };
     struct Active {
         std::shared_ptr<Mailbox> mailbox;
         std::unique_ptr<Run> run;
@@ -97,7 +101,8 @@ private:
     bool working_ = false;
     bool stopAfterThis_ = false;
     quint64 shown_ = 0;
-    const std::shared_ptr<std::atomic<QSize>> pictureRoom_ = std::make_shared<std::atomic<QSize>>();
+    const std::shared_ptr<std::atomic<PictureRoom>> pictureRoom_ =
+        std::make_shared<std::atomic<PictureRoom>>();
     int done_ = 0;
     int failed_ = 0;
     double secondsDone_ = 0;
