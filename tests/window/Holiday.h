@@ -6,8 +6,8 @@
 
 #include <string>
 
-/// Pictures in motion, at most ten seconds of them, with sound. What only has to take its time can be small.
-inline std::string Holiday(int seconds = 4, const std::string& size = "1280x720") {
+/// Pictures in motion, at most ten seconds of them, with sound; large ones are for people to look at.
+inline std::string Holiday(int seconds = 4, const std::string& size = "640x360") {
     const std::string pictures =
         "mandelbrot=s=" + size + ":r=25:start_scale=0.6:end_scale=0.01:end_pts=250,format=yuv420p";
     return test_movies::Make("window-" + size + "-" + std::to_string(seconds) + "s.mkv",

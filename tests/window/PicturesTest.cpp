@@ -66,7 +66,8 @@ TEST_F(PicturesTest, ConvertsMoviesWithALivePicture) {
     std::vector<std::string> movies;
     for (const char* name : {"Beach.mkv", "Mountains at dawn.mkv", "Grandma’s birthday.mkv", "Harbour.mkv"}) {
         // The first one long enough for the time that is left to be foretold.
-        std::filesystem::copy_file(Holiday(!movies.empty() ? 1 : forPeople ? 10 : 4), folder / name);
+        const int seconds = !movies.empty() ? 1 : forPeople ? 10 : 4;
+        std::filesystem::copy_file(Holiday(seconds, forPeople ? "1280x720" : "640x360"), folder / name);
         movies.push_back(folder / name);
     }
     WriteFile(folder / "Packing list.mkv", "Socks");
@@ -77,7 +78,7 @@ TEST_F(PicturesTest, ConvertsMoviesWithALivePicture) {
     Photograph("empty");
     app.TheQueue().Add(movies);
     AwaitExamined(movies.size());
-    EXPECT_EQ(At(0).facts->width, 1280);
+    EXPECT_EQ(At(0).facts->width, forPeople ? 1280 : 640);
     EXPECT_FALSE(At(4).unusable.isEmpty());
     auto* view = app.Window().findChild<QueueView*>();
     view->Select(At(1).id);
@@ -138,7 +139,7 @@ void ConvertUntilKilled(const std::string& folder) {
 TEST_F(PicturesTest, ComesBackAfterAKill) {
     if (const char* killed = std::getenv(kKilled))
         return ConvertUntilKilled(killed);
-    std::filesystem::copy_file(Holiday(10, "640x360"), folder / "movie.mkv");
+    std::filesystem::copy_file(Holiday(10), folder / "movie.mkv");
     setenv(kKilled, folder.Path().c_str(), 1);
     const pid_t child = fork();
     if (child == 0) {
