@@ -98,8 +98,8 @@ void MCDestroy(MCHandle converter);
 ///
 /// Codecs, picture format and file format stay 0, for which the media writer has no file: take the record of
 /// MCGetEncodeParam or MCEncodeParamForFile and change that. A stream that the file format cannot carry is
-/// switched off, and is not switched on again by a later call. A frame rate above 200 becomes 30 when there
-/// is a video decoder. Null completes the parameters that are set. Always 1.
+/// switched off: bNoVideo or bNoAudio becomes 1. A frame rate above 200 becomes 30 when there is a video
+/// decoder. Null completes the parameters that are set. Always 1.
 int MCSetEncodeParam(MCHandle converter, const EncodeParam* param);
 
 /// Fills in parameters for a file of that name: the file format by the name's extension, in capitals or not,
@@ -158,8 +158,8 @@ long long MCGetDiskFreeSpace(const wchar_t* path);
 /// 32-bit parameter 'HWND', 0 or 100 as 'WPAM' and the progress or the outcome as 'LPAM'. Without a callback
 /// there is one progress event, that of a completed conversion.
 ///
-/// 0 when started, and without effect when the converter runs already; MC_CANNOT_OPEN_SOURCE. Everything that
-/// goes wrong later is told by the outcome.
+/// 0 when started, and without effect when the converter runs already; MC_CANNOT_OPEN_SOURCE. What goes wrong
+/// later is told by the outcome; where no thread could be made, by MCGetResult alone.
 int MCStart(MCHandle converter, double begin, double length, OpaqueWindowPtr* window,
             ProgressCallback callback, void* context);
 

@@ -13,24 +13,29 @@ enum {
     kOutcomeCompleted = 0, ///< The source ended, or the requested length was reached.
     kOutcomeStopped = 1,   ///< MCStop or MCAbort.
     kOutcomeCancelled = 2, ///< The callback returned 0.
-    kOutcomeFailed = 3     ///< Could not start: nothing to convert, or the output could not be created.
+    /// Nothing to convert, no output or clip that could be created, an exception out of a decoder, or no
+    /// memory. What the writer does not take later is told by MCGetResult alone.
+    kOutcomeFailed = 3
 };
 
 #pragma pack(push, 4)
 
 /// 76 bytes in the 32-bit build, 80 in the 64-bit one. The engine's own; valid during the call only.
+///
+/// Once the file is closed, a last record comes with the finished call and, of a completed conversion, with a
+/// progress call before it.
 typedef struct ProgressInfo {
-    double dTotalLength;       ///< Length of the conversion in seconds.
-    double dPosition;          ///< Seconds of the source converted so far.
-    int32_t nPercent;          ///< nProgress / 100.
-    int32_t nProgress;         ///< Hundredths of a percent, at most 10000.
+    double dTotalLength; ///< Seconds to convert: the length asked for, or the rest that the source announces.
+    double dPosition;    ///< Seconds of the source converted so far, from the begin asked for.
+    int32_t nPercent;    ///< nProgress / 100.
+    int32_t nProgress;   ///< Hundredths of a percent, at most 10000; in the last record 10000 in any case.
     VideoImage* pPreviewImage; ///< The picture just written, the decoder's own record; or null.
     TimeData tElapsed;         ///< Wall-clock time since the conversion began, pauses included.
-    /// Estimated wall-clock time still needed; 0 while there is no estimate. When a source runs on past its
-    /// announced length, the estimate turns negative and shows as a very large time.
+    /// Estimated wall-clock time still needed; 0 while there is no estimate and in the last record. When a
+    /// source runs on past its announced length, the estimate turns negative and shows as a very large time.
     TimeData tRemaining;
-    /// dPosition again. In the final record the length of the conversion, or the requested length when only
-    /// sound was converted.
+    /// dPosition again. In the last record dTotalLength; of a conversion of sound alone the length that
+    /// MCStart was given, which may be 0.
     double dDoneLength;
     /// Seconds of source converted per second, as last estimated; 0 while there is no estimate.
     double dSpeed;

@@ -16,16 +16,18 @@
 /// The codes of formats and codecs stand in docs/decoders.md.
 typedef struct EncodeParam {
     uint32_t fccVideo;        ///< Video codec, "XVID" by default.
-    uint32_t fccColorFormat;  ///< Picture format handed to the media writer, "YV12" by default.
-    int32_t nBitCount;        ///< Bits per pixel of that picture format, 12 by default.
+    uint32_t fccColorFormat;  ///< "YV12" by default. Not read: each VideoImage tells its own format.
+    int32_t nBitCount;        ///< Bits per pixel of that format, 12 by default. Not read.
     int32_t nWidth;           ///< Output picture width in pixels.
     int32_t nHeight;          ///< Output picture height in pixels.
     double dFrameRate;        ///< Output pictures per second.
     int32_t nVideoRateMode;   ///< 0: one video bit rate; otherwise a target rate and an upper rate.
     int32_t nVideoBitrate;    ///< Video bit rate in bits per second.
     int32_t nVideoMaxBitrate; ///< Upper video bit rate in bits per second, used in two-rate mode.
-    int32_t bResize;          ///< 0: pictures of another shape get bars; else they fill the output.
-    uint32_t nReserved[5];    ///< Carried along unread; the media writer gives word 0 a meaning, 0 is none.
+    int32_t bResize;          ///< 0: pictures of another shape get bars; else they are distorted.
+    /// Word 0 is the number of a set of options of the media writer's, 0 for none; see writer/WriterStatus.h.
+    /// The others are not read. The engine hands all of them on as they are.
+    uint32_t nReserved[5];
     uint32_t fccAudio;        ///< Audio codec, "AAC " by default.
     int32_t nSampleRate;      ///< Audio samples per second and channel.
     int32_t nChannels;        ///< Audio channels.
@@ -38,17 +40,17 @@ typedef struct EncodeParam {
     uint32_t fccFileFormat;   ///< Container, "MP4 " by default.
 } EncodeParam;
 
-/// One entry of the media writer's table of file formats: 828 bytes. The engine reads only the three fields
-/// that are described as such; the text fields are the writer's, for hosts that list formats.
+/// One entry of the media writer's table of file formats: 828 bytes. Only what can be encoded on this machine
+/// is in it.
 typedef struct FileFormatInfo {
-    uint32_t fccFormat;     ///< The format's code; 0 ends the table. Read by the engine.
+    uint32_t fccFormat;     ///< The format's code; 0 ends the table.
     char szName[128];       ///< Human-readable name, UTF-8, zero-terminated.
     char szExtensions[128]; ///< File-name extensions without dots, separated by commas, the usual one first.
     uint32_t fccVideoCodecs[32]; ///< Video codecs that the format carries, the default first; 0 ends them.
     uint32_t fccAudioCodecs[32]; ///< Audio codecs that the format carries, the default first; 0 ends them.
     unsigned char reserved[296]; ///< Zero.
-    int32_t bHasAudio;           ///< 0: the format cannot carry sound. Read by the engine.
-    int32_t bHasVideo;           ///< 0: the format cannot carry pictures. Read by the engine.
+    int32_t bHasAudio;           ///< 0: the format cannot carry sound.
+    int32_t bHasVideo;           ///< 0: the format cannot carry pictures.
     unsigned char reserved2[8];  ///< Zero.
 } FileFormatInfo;
 

@@ -60,18 +60,18 @@ typedef struct VideoImage {
     int32_t nType;              ///< kMediaTypePicture.
     int32_t nFormat;            ///< Pixel layout, kPictureFormatPlanar420 or ...Deep.
     unsigned char* pY;          ///< Luma plane.
-    unsigned char* pU;          ///< Cb plane, half width and half height.
-    unsigned char* pV;          ///< Cr plane, half width and half height.
+    unsigned char* pU;          ///< Cb plane, half width and half height, rounded up.
+    unsigned char* pV;          ///< Cr plane, likewise.
     int32_t nReserved;          ///< Copied unchanged.
     int32_t nWidth;             ///< Width in pixels.
     int32_t nHeight;            ///< Height in pixels.
     int32_t nPitchY;            ///< Bytes from one luma row to the next.
     int32_t nPitchU;            ///< Bytes from one row of pU to the next.
     int32_t nPitchV;            ///< Bytes from one row of pV to the next.
-    unsigned char reserved[12]; ///< Copied unchanged.
+    unsigned char reserved[12]; ///< Copied unchanged. The media writer looks for a WriterSourceTime in it.
     int64_t llTime2;            ///< Second time stamp, shifted exactly as llTime is; 100 ns units.
     int64_t llTime;             ///< Time stamp, 100 ns units; -1 when the picture has none.
-    int32_t nDuration;          ///< Duration, 100 ns units.
+    int32_t nDuration;          ///< Duration, 100 ns units; 0 or less when it is not known.
 } VideoImage;
 
 /// One block of interleaved PCM sound: 76 bytes in the 32-bit build, 80 in the 64-bit one.
@@ -83,7 +83,7 @@ typedef struct AudioFrame {
     unsigned char* pData;       ///< First byte of the samples.
     int32_t nLength;            ///< Bytes of sound in this block; 0 means that the sound has ended.
     int32_t nBufferSize;        ///< Bytes available behind pData.
-    unsigned char reserved[28]; ///< Not read; zero in the engine's own blocks.
+    unsigned char reserved[28]; ///< As VideoImage's; zero in the engine's own blocks.
     int64_t llTime2;            ///< Second time stamp, 100 ns units.
     int64_t llTime;             ///< Time stamp of the first sample, 100 ns units.
     int32_t nDuration;          ///< Duration, 100 ns units.

@@ -33,8 +33,8 @@ int MWWriteVideoFrame(void* file, const VideoImage* image);
 int MWWriteAudioData(void* file, const AudioFrame* frame);
 
 /// Finishes and closes the file; the handle is gone afterwards. A null handle is accepted and does nothing.
-/// `callback` and `context` may be null; the writer may report through them while it finishes. Nonzero when
-/// the file is complete.
+/// `callback` and `context` may be null and are not used: WriterOptions::pfnListener is told how far it is.
+/// Nonzero when the file is complete; 0 also for one that got nothing, which is removed.
 int MWCloseMediaFile(void* file, ProgressCallback callback, void* context);
 
 #pragma GCC visibility pop

@@ -9,10 +9,10 @@
 ///
 /// kind 0: progress; `value` is 0 to 10000 hundredths of a percent, `info` points to a ProgressInfo that is
 /// valid during the call. Returning 0 cancels the conversion. kind 1: finished, the last call of a
-/// conversion; `value` is the outcome (0 completed, 1 stopped, 2 cancelled by the callback, 3 could not
-/// start), `info` points to the final ProgressInfo, or is 0 for outcome 3. The result is ignored.
+/// conversion; `value` is the outcome, kOutcome... in engine/ProgressInfo.h, `info` points to the
+/// last ProgressInfo, or is 0 for kOutcomeFailed. The result is ignored.
 ///
-/// The callback must not call MCStop, MCWait or MCDestroy, which wait for the very thread it runs on.
+/// MCStop, MCWait and MCDestroy are refused inside the callback: they wait for the very thread it runs on.
 typedef unsigned (*ProgressCallback)(void* context, unsigned kind, unsigned value, uintptr_t info);
 
 #endif

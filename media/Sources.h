@@ -27,10 +27,9 @@ typedef struct MCVideoSource {
     int (*pfnGetFormat)(void* pUser, VideoFormat* format);
 
     /// Moves to the picture shown at `seconds`. Called at most once in a conversion, before its first
-    /// picture, and at a begin of 0 not at all where there is sound too, or pictures alone, unless an earlier
-    /// conversion has read from the source. Nonzero, or 0 when that fails, which ends the conversion as an
-    /// error. May be null: pictures before `seconds` are read and left out, and a later conversion goes on
-    /// where the source stands.
+    /// picture; for a begin of 0 only when an earlier conversion has read from the source. Nonzero, or 0 when
+    /// that fails, which ends the pictures as an error of pfnGetPicture does. May be null: pictures before
+    /// `seconds` are read and left out, and a later conversion goes on where the source stands.
     int (*pfnSeek)(void* pUser, double seconds);
 
     /// Gives the next picture: 1. At the end 0; a negative number of the host's own is an error, which ends
@@ -59,7 +58,8 @@ typedef struct MCAudioSource {
     /// too. May be null: blocks that end before `seconds` are read and left out.
     int (*pfnSeek)(void* pUser, double seconds);
 
-    /// Gives the next block of sound: 1. At the end 0; a negative number is an error, as with pictures.
+    /// Gives the next block of sound: 1. At the end 0, or a block with nLength 0; a negative number is an
+    /// error, as with pictures.
     ///
     /// `block` comes filled in with the format and with llTime (of the block after the last one, or of the
     /// place sought); pData and nLength must be set. nBufferSize, nDuration and llTime2 follow from these.

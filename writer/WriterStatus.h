@@ -54,7 +54,7 @@ enum {
     kWriterErrorArgument = 1, ///< The parameters make no sense: no name, no stream, a negative size.
     kWriterErrorFormat = 2,   ///< The file format is not in the table.
     kWriterErrorCodec = 3,   ///< The format cannot carry the codec, or this build of FFmpeg cannot encode it.
-    kWriterErrorExists = 4,  ///< The target exists and WriterOptions forbids replacing it.
+    kWriterErrorExists = 4,  ///< The target exists and is not to be replaced, or is being written already.
     kWriterErrorOpen = 5,    ///< The temporary file could not be created; see nSystemError.
     kWriterErrorNoSpace = 6, ///< The disk or the quota is full.
     kWriterErrorWrite = 7,   ///< Another write failure; see nSystemError.
@@ -121,9 +121,9 @@ enum {
     kWriterEventClosed = 5 ///< The file is complete, or the failed or empty one is closed.
 };
 
-/// Told of what happens to files. Called on the engine's worker for all but kWriterEventFailed, which may
-/// come on a thread of the writer's. It must return soon and must not call back into the converter except for
-/// MCAbort.
+/// Told of what happens to files. Called on the thread that calls the writer, which is the engine's worker in
+/// a conversion; kWriterEventFailed may come on a thread of the writer's. It must return soon and must not
+/// call back into the converter except for MCAbort.
 typedef void (*WriterListener)(void* context, int event, const WriterStatus* status);
 
 /// Asked when the disk is full. May block, for instance until there is room or the user gives up. Nonzero:
@@ -151,9 +151,9 @@ typedef struct WriterOptions {
     int32_t nColorPrimaries;  ///< As in ISO/IEC 23091-2; 0 or 2: not stated.
     int32_t nColorTransfer;   ///< As in ISO/IEC 23091-2; 0 or 2: not stated.
     int32_t nColorMatrix;     ///< As in ISO/IEC 23091-2; 0 or 2: not stated.
-    /// Threads of the picture encoder; 0: one, for VP8 and VP9 one a processor, for H.264 one and a half, 16
-    /// at most. HEVC has threads of its own beside.
-    /// The number may change the output, timing never does.
+    /// Threads of the picture encoder. 0: one for each processor for VP8, VP9 and FFV1, two for H.264, 16 at
+    /// most; else one. HEVC and AV1 use threads of their own, whatever is asked for. Their number may change
+    /// the output, timing never does.
     int32_t nEncoderThreads;
     int32_t bBitExact;          ///< Nonzero: nothing in the file tells time, date or library version.
     int32_t bKeepExisting;      ///< Nonzero: a target that exists is never replaced; creating it fails.
@@ -190,8 +190,9 @@ typedef struct WriterOptions {
     /// Nonzero: the sound that is written tells how long files are and does not go into them. Their sound are
     /// tracks (MWAddTrack).
     int32_t bSoundBeside;
-    /// Nonzero: pictures come exactly at EncodeParam's rate, left out or repeated. By default a source of the
-    /// same rate keeps its own times, but in MPG, and MPEG-2 comes at the next rate above that it has.
+    /// Nonzero: pictures come exactly at EncodeParam's rate, left out or repeated, and a rate that the codec
+    /// cannot show makes the file fail. 0: a source of about that rate keeps its own times, except in MPG;
+    /// and the rate becomes one that the codec has: the next one from it on for MPEG-2, 50 at most for GIF.
     int32_t bSteadyRate;
     /// The loudspeakers that the channels of the sound are for: FFmpeg's AV_CH_..., together, in whose order
     /// the channels come. 0, or another number of them than there are channels: the usual ones of that

@@ -18,7 +18,7 @@ class BatchJournal {
 public:
     enum class State {
         kUnknown, ///< Nothing is known of the output.
-        kBegun,   ///< It was begun from this source with these settings, and how that ended is not known.
+        kBegun,   ///< What stands there was begun from this source with these settings; no more is known.
         kDone,    ///< It was made of this source with these settings, and still stands there.
     };
 

@@ -1,4 +1,4 @@
-// What --list-formats, --list-presets and --show-preset print.
+// What --list-formats and --list-presets print, and the names that are offered as values of options.
 #ifndef MOVIECONV_HOST_TERMINAL_LISTINGS_H
 #define MOVIECONV_HOST_TERMINAL_LISTINGS_H
 

@@ -1,4 +1,4 @@
-// The files that the program writes beside the output: log and preview.
+// The files that the user has the program write beside the output: log, preview and plan.
 #ifndef MOVIECONV_HOST_TERMINAL_SIDEFILECHECK_H
 #define MOVIECONV_HOST_TERMINAL_SIDEFILECHECK_H
 
@@ -6,8 +6,8 @@
 
 namespace movieconv {
 
-/// Throws Failure when the log or the preview would be written over what the program reads, or over
-/// what else it writes, or over each other, or the preview over what is no preview.
+/// Throws Failure when the log, the preview or the plan would be written over what the program reads, or over
+/// what else it writes, or the log over one of the others, or the preview over what is no preview.
 void CheckSideFiles(const Options& options);
 
 } // namespace movieconv
