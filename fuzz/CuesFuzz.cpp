@@ -2,6 +2,7 @@
 // set, divided among clips, merged into one row, laid out as a script.
 #include "fuzz/Fuzz.h"
 #include "host/source/BesideTrack.h"
+#include "host/source/Charset.h"
 #include "host/source/CueDrawer.h"
 #include "host/source/CueList.h"
 #include "host/source/SourceError.h"
@@ -26,7 +27,7 @@ std::vector<av::Packet> PacketsOf(const std::string& path) {
     std::vector<av::Packet> packets;
     try {
         SubtitleFile file(path, "");
-        while (av::Packet packet = file.Take().packet)
+        while (av::Packet packet = file.Take())
             packets.push_back(std::move(packet));
     } catch (const SourceError&) {
         packets.clear();
@@ -132,9 +133,9 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
                                   "Dialogue: 0,0:00:01.00,0:00:02.00,Default,,0,0,0,,")};
     const std::string text = heads[kind] + rest;
     try {
-        const std::string converted = ToUtf8(text, charset);
+        const std::string converted = Decoded(text, charset);
         const bool isMarked = converted == text;
-        FUZZ_CHECK(isMarked || ToUtf8(converted, "UTF-8") == converted);
+        FUZZ_CHECK(isMarked || Decoded(converted, "UTF-8") == converted);
     } catch (const SourceError&) {
         FUZZ_CHECK(!charset.empty());
     }

@@ -1,5 +1,6 @@
 #include "host/source/BesideTracks.h"
 
+#include "host/source/Charset.h"
 #include "host/source/EarlierCues.h"
 #include "host/source/MediaTime.h"
 
@@ -73,8 +74,12 @@ BesidePackets& BesideTracks::ReadFile(const std::string& path, const std::string
     const auto clock = [](int64_t stamp, AVRational timeBase) {
         return av_rescale_q(stamp, timeBase, {1, kTicksPerSecond});
     };
-    auto track = std::make_unique<BesidePackets>([&file](int64_t, bool) { return file.Take(); }, clock,
-                                                 stream->time_base, bounds_, failures_);
+    const auto take = [&file](int64_t, bool) -> Demuxer::Beside {
+        av::Packet packet = file.Take();
+        const bool ended = packet == nullptr;
+        return {std::move(packet), ended};
+    };
+    auto track = std::make_unique<BesidePackets>(take, clock, stream->time_base, bounds_, failures_);
     BesidePackets& made = *track;
     tracks_.push_back(std::move(track));
     return made;

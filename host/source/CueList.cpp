@@ -1,5 +1,6 @@
 #include "host/source/CueList.h"
 
+#include "host/source/Charset.h"
 #include "host/source/MediaTime.h"
 #include "host/source/PacketClock.h"
 #include "host/source/PacketTime.h"
@@ -83,7 +84,7 @@ void ReadFile(CueList& list, const Source& source, const BurnWish& wish) {
         const AVStream& stream = file.Stream();
         CheckDecodable(*stream.codecpar, wish);
         list.parameters = av::CopyOf(*stream.codecpar);
-        while (av::Packet packet = file.Take().packet) {
+        while (av::Packet packet = file.Take()) {
             const auto ticks = [&](int64_t stamp) {
                 return av_rescale_q(stamp, stream.time_base, {1, kTicksPerSecond});
             };

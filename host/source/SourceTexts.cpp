@@ -1,7 +1,7 @@
 #include "host/source/SourceTexts.h"
 
+#include "host/source/Charset.h"
 #include "host/source/Languages.h"
-#include "host/source/SubtitleFile.h"
 
 #include <algorithm>
 #include <cctype>
@@ -86,7 +86,7 @@ void DropCopies(std::vector<Tag>& tags) {
 void ReplaceTag(std::vector<Tag>& tags, const std::string& key, const std::string& text) {
     const auto known = FindTag(tags, key);
     if (known != tags.end() && !text.empty())
-        known->value = ToUtf8(text, "");
+        known->value = Decoded(text);
 }
 
 /// Of a chapter's titles the first one is what people gave it first.
@@ -94,10 +94,10 @@ void PreferFirstTitles(const std::vector<ContainerNotes::Titles>& titles, std::v
     auto next = chapters.begin();
     for (const ContainerNotes::Titles& each : titles) {
         const auto found = std::find_if(next, chapters.end(), [&](const Chapter& chapter) {
-            return chapter.title == ToUtf8(each.last, "");
+            return chapter.title == Decoded(each.last);
         });
         if (found != chapters.end()) {
-            found->title = ToUtf8(each.first, "");
+            found->title = Decoded(each.first);
             next = found + 1;
         }
     }
@@ -108,10 +108,10 @@ void DescribeFiles(const std::vector<ContainerNotes::File>& files, std::vector<S
     for (const ContainerNotes::File& file : files) {
         const auto stream = std::find_if(streams.begin(), streams.end(), [&](const StreamInfo& each) {
             return each.kind == StreamKind::kAttachment && each.title.empty() &&
-                   each.fileName == ToUtf8(file.name, "");
+                   each.fileName == Decoded(file.name);
         });
         if (stream != streams.end())
-            stream->title = ToUtf8(file.description, "");
+            stream->title = Decoded(file.description);
     }
 }
 
@@ -127,7 +127,7 @@ void TakeNotes(const ContainerNotes& notes, SourceInfo& info) {
         if (tag.find('-') != std::string::npos || language != ThreeLetters(stream.language))
             stream.languageTag = tag;
         if (stream.title.empty())
-            stream.title = ToUtf8(notes.streams[i].title, "");
+            stream.title = Decoded(notes.streams[i].title);
     }
     for (const Tag& tag : notes.repeated)
         ReplaceTag(info.tags, tag.key, tag.value);

@@ -1,9 +1,9 @@
 #include "host/source/StreamDescription.h"
 
 #include "ffmpeg/Loudspeakers.h"
+#include "host/source/Charset.h"
 #include "host/source/ColourMatrix.h"
 #include "host/source/MediaTime.h"
-#include "host/source/SubtitleFile.h"
 
 #include <algorithm>
 #include <array>
@@ -41,7 +41,7 @@ bool IsNote(const std::string& key) {
 /// Old files have texts in the character set of their time; no container of today takes these.
 std::string TagOf(const AVDictionary* metadata, const char* key) {
     const AVDictionaryEntry* entry = av_dict_get(metadata, key, nullptr, 0);
-    return entry != nullptr ? ToUtf8(entry->value, "") : "";
+    return entry != nullptr ? Decoded(entry->value) : "";
 }
 
 std::vector<Tag> TagsWithout(const AVDictionary* metadata, std::string_view left) {
@@ -349,7 +349,7 @@ std::vector<Tag> DescribeTags(const AVDictionary* metadata) {
     const AVDictionaryEntry* entry = nullptr;
     while ((entry = av_dict_get(metadata, "", entry, AV_DICT_IGNORE_SUFFIX)) != nullptr)
         if (!IsNote(entry->key))
-            tags.push_back({UsualKey(*metadata, ToUtf8(entry->key, "")), ToUtf8(entry->value, "")});
+            tags.push_back({UsualKey(*metadata, Decoded(entry->key)), Decoded(entry->value)});
     return tags;
 }
 

@@ -2,7 +2,7 @@
 
 #include "host/convert/Formats.h"
 #include "host/presets/Notation.h"
-#include "host/source/SubtitleFile.h"
+#include "host/source/Charset.h"
 
 #include <algorithm>
 #include <cctype>
@@ -69,7 +69,7 @@ bool ReadMetadata(const std::string& text, Request& request) {
     if (equals == std::string::npos || equals == 0)
         return false;
     // From a terminal of another character set; containers hold UTF-8 only.
-    request.metadata.push_back({ToUtf8(text.substr(0, equals), ""), ToUtf8(text.substr(equals + 1), "")});
+    request.metadata.push_back({Decoded(text.substr(0, equals)), Decoded(text.substr(equals + 1))});
     return true;
 }
 

@@ -1,10 +1,10 @@
 // How a movie is described, which of its streams are chosen, and how far it is read ahead.
 #include "host/source/Source.h"
+#include "host/source/Charset.h"
 #include "host/source/CueList.h"
 #include "host/source/Demuxer.h"
 #include "host/source/Failures.h"
 #include "host/source/StreamChoice.h"
-#include "host/source/SubtitleFile.h"
 #include "tests/support/Inspect.h"
 #include "tests/support/Program.h"
 #include "tests/support/TestMovies.h"
@@ -222,7 +222,7 @@ TEST(Source, ReadingAheadIsInterruptedWithIt) {
 }
 
 TEST(CharacterSets, WithAccentsBehindTheirLettersKeepTheLastLetter) {
-    EXPECT_EQ(movieconv::ToUtf8("ch\xE0o", "CP1258"), "ch\xC3\xA0o");
+    EXPECT_EQ(movieconv::Decoded("ch\xE0o", "CP1258"), "ch\xC3\xA0o");
 }
 
 } // namespace
