@@ -8,11 +8,10 @@
 #include "host/convert/Room.h"
 #include "host/convert/SizePlan.h"
 #include "host/convert/SoundLoss.h"
+#include "host/convert/Sources.h"
 #include "host/convert/Timecode.h"
-#include "host/source/CropDetection.h"
 #include "host/source/MediaTime.h"
 #include "text/FileNames.h"
-#include "text/Path.h"
 #include "text/Utf8.h"
 
 #include <algorithm>
@@ -22,9 +21,7 @@
 #include <cstring>
 #include <filesystem>
 #include <fmt/format.h>
-#include <iterator>
 #include <limits>
-#include <map>
 #include <string_view>
 #include <utility>
 
@@ -40,17 +37,6 @@ bool HasShrunk(const SourceInfo& source) {
     std::error_code unknown;
     const auto bytes = std::filesystem::file_size(source.path, unknown);
     return !unknown && static_cast<int64_t>(bytes) < source.bytes;
-}
-
-std::string TellCrop(const SourceInfo& source) {
-    const PictureStreamInfo& pictures = *source.pictures;
-    const Crop& crop = pictures.crop;
-    if (!CanBeLookedAtBefore(source.path))
-        return "black borders cannot be looked for in a pipe";
-    if (crop.CutsNothing())
-        return "no black borders were found";
-    return fmt::format("the pictures are cropped to {}x{}: {} above, {} below, {} left, {} right",
-                       pictures.width, pictures.height, crop.top, crop.bottom, crop.left, crop.right);
 }
 
 /// Of a piece the plan knows it better than the source.
@@ -71,7 +57,8 @@ Course::Course(const Request& request, Movie& movie, Wishes& wishes, Observer& o
       watch_(request_, movie.Info(), wishes.bell),
       files_(observer, request.firstClip ? request.firstClip->number : 0),
       engine_(MakeEngine(request_, movie.Info(), clips_.Pictures(), clips_.Sound(), watch_.OptionSet())),
-      clock_(WorkClock::Now()) {
+      clock_(WorkClock::Now()),
+      room_(request_.output, observer) {
     if (request.firstClip) {
         clips_.BeginAt(request.firstClip->begin);
         earlier_ = clips_.Offset();
@@ -98,11 +85,8 @@ void Course::Prepare() {
         observer_.Warned({Warning::Kind::kChosen, TellSize(request_)});
     if (!request_.piece && request_.detectCrop && movie_.Info().pictures)
         observer_.Warned({Warning::Kind::kChosen, TellCrop(movie_.Info())});
-    if (!request_.piece && (lengthKnown || request_.length)) {
-        sizeIsKnown_ = HasRates(request_, ChooseFormat(request_), movie_.Info());
-        if (sizeIsKnown_)
-            CheckKnownSize();
-    }
+    if (!request_.piece && (lengthKnown || request_.length))
+        LookAtRoom();
 }
 
 Verdict Course::Run() {
@@ -171,30 +155,15 @@ void Course::AwaitResume() {
     UpdateClock();
 }
 
-/// When there is less room than for so many further bytes; once.
-void Course::WarnOfSmallRoom(int64_t further, const std::string& needed) {
-    const int64_t free = FreeBytes(text::FolderOf(request_.output));
-    if (roomIsSmall_ || free < 0 || free >= further)
+/// Before anything is converted.
+void Course::LookAtRoom() {
+    if (!HasRates(request_, ChooseFormat(request_), movie_.Info())) {
+        room_.Forecast();
         return;
-    roomIsSmall_ = true;
-    observer_.Warned({Warning::Kind::kSmallRoom, fmt::format("\"{}\" needs about {}, but only {} are free",
-                                                             request_.output, needed, FormatBytes(free))});
-}
-
-void Course::CheckKnownSize() {
+    }
     EncodeParam param{};
     MCGetEncodeParam(engine_.get(), &param);
-    const int64_t needed = MCGetEstimateDiskSpaceEx(&param, length_);
-    WarnOfSmallRoom(needed, FormatBytes(needed));
-}
-
-/// Warns when not even the middle of what is expected finds room.
-void Course::CheckExpectedSize(const Progress& report) {
-    if (!report.expected || roomIsSmall_ || report.phase != Phase::kConverting)
-        return;
-    const ByteRange& whole = *report.expected;
-    WarnOfSmallRoom(whole.least + (whole.most - whole.least) / 2 - report.bytes,
-                    FormatByteRange(whole.least - report.bytes, whole.most - report.bytes) + " more");
+    room_.CheckKnown(MCGetEstimateDiskSpaceEx(&param, length_));
 }
 
 /// The engine's worker calls this.
@@ -218,8 +187,7 @@ void Course::WaitForEnd() {
         FollowWishes();
         TakeNews();
         Show();
-        if (!sizeIsKnown_)
-            size_.Add(Reached(), watch_.Bytes());
+        room_.Add(Reached(), watch_.Bytes());
         LookAfterFile();
         if (outcome_ == kNone)
             ReportProgress();
@@ -316,8 +284,7 @@ Progress Course::Figures() {
         report.left = speed_.Left(length_);
     }
     report.bytes = watch_.Bytes();
-    if (!sizeIsKnown_)
-        report.expected = size_.Total(length_);
+    report.expected = room_.Expected(length_);
     report.finished = files_.Finishing().value_or(0);
     report.clip = request_.split ? files_.Opened() : 0;
     return report;
@@ -344,7 +311,7 @@ void Course::ReportProgress() {
     report.phase = phase;
     report.phaseChanged = changed;
     observer_.Progressed(report);
-    CheckExpectedSize(report);
+    room_.Check(report);
 }
 
 Verdict Course::Conclude() {
@@ -370,22 +337,9 @@ Verdict Course::Conclude() {
     verdict.files = files_.Complete();
     verdict.damaged = movie_.DamagedPictures();
     if (verdict.outcome == Outcome::kDone && request_.split)
-        WarnOfOlderClips();
+        if (const std::optional<Warning> older = OlderClips(request_.output, files_.Opened()))
+            observer_.Warned(*older);
     return verdict;
-}
-
-/// Of clips that were there before, with higher numbers than the new ones.
-void Course::WarnOfOlderClips() {
-    const std::map<int, std::string> clips = ClipsOf(request_.output);
-    const auto first = clips.lower_bound(files_.Opened());
-    const auto count = std::distance(first, clips.end());
-    if (count > 0)
-        observer_.Warned(
-            {Warning::Kind::kOlderClips,
-             count == 1
-                 ? fmt::format("\"{}\" of an earlier conversion stays beside the new clips", first->second)
-                 : fmt::format("\"{}\" to \"{}\" of an earlier conversion stay beside the new clips",
-                               first->second, clips.rbegin()->second)});
 }
 
 /// Why the source ended before what it promises, and before the length that was asked for; empty when it did

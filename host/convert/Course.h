@@ -11,7 +11,7 @@
 #include "host/convert/Observer.h"
 #include "host/convert/PictureTap.h"
 #include "host/convert/Request.h"
-#include "host/convert/SizeForecast.h"
+#include "host/convert/RoomWatch.h"
 #include "host/convert/SpeedMeter.h"
 #include "host/convert/WorkClock.h"
 #include "host/convert/WriterWatch.h"
@@ -60,9 +60,7 @@ private:
     void RunEngine(double begin, double length);
     bool GoesOn();
     void AwaitResume();
-    void WarnOfSmallRoom(int64_t further, const std::string& needed);
-    void CheckKnownSize();
-    void CheckExpectedSize(const Progress& report);
+    void LookAtRoom();
     void WaitForEnd();
     void FollowWishes();
     void TakeNews();
@@ -80,7 +78,6 @@ private:
     double Reached() const;
     std::string WhyItEndedEarly() const;
     void ReportComplaints();
-    void WarnOfOlderClips();
 
     const Request request_; // with rates by the greatest size
     Movie& movie_;
@@ -100,9 +97,7 @@ private:
 
     WorkClock clock_;
     SpeedMeter speed_;
-    SizeForecast size_;
-    bool sizeIsKnown_ = true;  // or cannot be told at all, without a length
-    bool roomIsSmall_ = false; // which was told
+    RoomWatch room_;
     bool paused_ = false;
     bool userStopped_ = false;
     bool cutShort_ = false;            // by the user, before the engine's end was known

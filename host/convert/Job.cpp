@@ -26,6 +26,8 @@ void StandBack(int niceness) {
         setpriority(PRIO_PROCESS, 0, std::min(getpriority(PRIO_PROCESS, 0) + niceness, kMost));
 }
 
+struct StopWished : std::exception {};
+
 } // namespace
 
 class Job::Impl {
@@ -66,6 +68,7 @@ private:
     void Run() noexcept;
     Verdict Convert();
     void SetOpening(std::shared_ptr<Interruption> opening);
+    void HeedStop() const;
 
     const Request request_;
     Outlet outlet_;
@@ -85,29 +88,32 @@ void Job::Impl::Run() noexcept {
 Verdict Job::Impl::Convert() {
     ChooseFormat(request_);
     CheckOutput(request_);
-    Verdict stopped;
-    stopped.outcome = Outcome::kStopped;
     const auto interruption = std::make_shared<Interruption>();
     bool open = false;
     try {
         SetOpening(interruption);
-        if (wishes_.stop)
-            return stopped;
+        HeedStop();
         Movie movie = OpenMovie(request_, interruption);
-        if (wishes_.stop)
-            return stopped;
+        HeedStop();
         Course course(request_, movie, wishes_, outlet_);
         course.Prepare();
         SetOpening(nullptr);
-        if (wishes_.stop)
-            return stopped;
+        HeedStop();
         open = true;
         return course.Run();
-    } catch (const std::exception&) {
+    } catch (const std::exception&) { // also what an interrupted source ends with
         if (open || !wishes_.stop)
             throw;
+        Verdict stopped;
+        stopped.outcome = Outcome::kStopped;
         return stopped;
     }
+}
+
+/// Ends what comes before the course.
+void Job::Impl::HeedStop() const {
+    if (wishes_.stop)
+        throw StopWished();
 }
 
 void Job::Impl::SetOpening(std::shared_ptr<Interruption> opening) {

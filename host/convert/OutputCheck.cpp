@@ -13,6 +13,7 @@
 #include <cstring>
 #include <dirent.h>
 #include <fmt/format.h>
+#include <iterator>
 #include <memory>
 #include <optional>
 #include <string_view>
@@ -124,6 +125,19 @@ std::map<int, std::string> ClipsOf(const std::string& output) {
         if (const std::optional<int> number = ClipNumber(entry->d_name, name))
             clips.emplace(*number, folder + "/" + entry->d_name);
     return clips;
+}
+
+std::optional<Warning> OlderClips(const std::string& output, int firstFree) {
+    const std::map<int, std::string> clips = ClipsOf(output);
+    const auto first = clips.lower_bound(firstFree);
+    const auto count = std::distance(first, clips.end());
+    if (count == 0)
+        return std::nullopt;
+    return Warning{
+        Warning::Kind::kOlderClips,
+        count == 1 ? fmt::format("\"{}\" of an earlier conversion stays beside the new clips", first->second)
+                   : fmt::format("\"{}\" to \"{}\" of an earlier conversion stay beside the new clips",
+                                 first->second, clips.rbegin()->second)};
 }
 
 const char* WhatIsReadFrom(const std::string& path, const Request& request) {

@@ -2,9 +2,11 @@
 #ifndef MOVIECONV_HOST_CONVERT_OUTPUTCHECK_H
 #define MOVIECONV_HOST_CONVERT_OUTPUTCHECK_H
 
+#include "host/convert/Observer.h"
 #include "host/convert/Request.h"
 
 #include <map>
+#include <optional>
 #include <string>
 
 namespace movieconv {
@@ -20,6 +22,10 @@ void CheckName(const std::string& path, const std::string& suffix = {});
 
 /// Whatever stands under the names of clips of `output`: their numbers and paths.
 std::map<int, std::string> ClipsOf(const std::string& output);
+
+/// What is told of clips of an earlier conversion, which have numbers from `firstFree` on; nothing when there
+/// are none.
+std::optional<Warning> OlderClips(const std::string& output, int firstFree);
 
 /// What the conversion reads the file of that name as, "the source itself" or "a file of subtitles that is
 /// read"; null when it does not read it.

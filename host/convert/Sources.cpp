@@ -8,6 +8,7 @@
 #include "host/source/StreamChoice.h"
 
 #include <cstddef>
+#include <fmt/format.h>
 #include <utility>
 
 namespace movieconv {
@@ -91,6 +92,17 @@ SourceInfo LookAtSource(const Request& request) {
     const auto interruption = std::make_shared<Interruption>();
     return Opened(
         [&] { return Source(request.input, CroppedChoiceOf(request, interruption), interruption).Info(); });
+}
+
+std::string TellCrop(const SourceInfo& source) {
+    const PictureStreamInfo& pictures = *source.pictures;
+    const Crop& crop = pictures.crop;
+    if (!CanBeLookedAtBefore(source.path))
+        return "black borders cannot be looked for in a pipe";
+    if (crop.CutsNothing())
+        return "no black borders were found";
+    return fmt::format("the pictures are cropped to {}x{}: {} above, {} below, {} left, {} right",
+                       pictures.width, pictures.height, crop.top, crop.bottom, crop.left, crop.right);
 }
 
 SourceInfo AsAskedFor(SourceInfo source, const Request& request) {

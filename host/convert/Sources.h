@@ -6,6 +6,7 @@
 #include "host/source/Movie.h"
 
 #include <memory>
+#include <string>
 
 namespace movieconv {
 
@@ -15,6 +16,9 @@ Movie OpenMovie(const Request& request,
 
 /// What it holds. Throws Failure.
 SourceInfo LookAtSource(const Request& request);
+
+/// How the pictures were cropped, where that was looked for.
+std::string TellCrop(const SourceInfo& source);
 
 /// A source that was looked at, whatever was chosen then, with the pictures and the sound that the request
 /// chooses. Of others than before there is only what the container tells. Throws Failure when a track that is
