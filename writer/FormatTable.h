@@ -23,36 +23,37 @@ enum class QualityKind {
 };
 
 struct QualityScale {
-    QualityKind kind;
-    double best;
-    double worst;
+    QualityKind kind = QualityKind::kNone;
+    double best = 0;
+    double worst = 0;
 };
 
 /// How an encoder is told how long to look for a smaller file.
 struct SpeedScale {
-    const char* option;                ///< Null: it has no such choice.
-    std::array<const char*, 7> values; ///< From the slowest.
+    const char* option = nullptr;        ///< Null: it has no such choice.
+    std::array<const char*, 7> values{}; ///< From the slowest.
 };
 
 constexpr int kUsualSpeed = 5; ///< On the scale of WriterOptions, where none is chosen.
 
 /// A codec for pictures.
 struct PictureCodec {
-    uint32_t code;
-    AVCodecID id;
-    const char* encoder;
-    AVPixelFormat format; ///< Of the pictures that the encoder gets; a "J" format: luma covers 0 to 255.
-    bool deep;            ///< Pictures of 10 bits are taken as well.
-    bool evenSize;        ///< Odd widths and heights are not accepted.
+    uint32_t code = 0;
+    AVCodecID id = AV_CODEC_ID_NONE;
+    const char* encoder = nullptr;
+    /// Of the pictures that the encoder gets; a "J" format: luma covers 0 to 255.
+    AVPixelFormat format = AV_PIX_FMT_YUV420P;
+    bool deep = false;     ///< Pictures of 10 bits are taken as well.
+    bool evenSize = false; ///< Odd widths and heights are not accepted.
     /// Threads for each processor where the caller leaves the choice: 0 for one thread. The output depends on
     /// their number, never on timing.
-    double threads;
-    QualityScale quality;
-    SpeedScale speed; ///< An encoder that has one has to be told how far key frames may lie apart.
+    double threads = 0;
+    QualityScale quality{};
+    SpeedScale speed{}; ///< An encoder that has one has to be told how far key frames may lie apart.
     /// Pictures that the encoder takes before it gives the packet of an earlier one, at most, by the speed.
     /// 0: none, or it cannot be told after which picture to cut.
-    std::array<int, 7> looksAhead;
-    const char* options; ///< For the encoder in any case, as "name=value,...".
+    std::array<int, 7> looksAhead{};
+    const char* options = ""; ///< For the encoder in any case, as "name=value,...".
     int longest = 0; ///< Seconds that a picture can be shown before it has to be there again; 0: any time.
     const AVRational* rates = nullptr; ///< All that every player knows, rising, ended by 0; null: any rate.
     bool isBt601 = false; ///< Decoders know but the matrix of BT.601, whatever a container tells.
@@ -61,12 +62,12 @@ struct PictureCodec {
 
 /// A codec for sound.
 struct SoundCodec {
-    uint32_t code;
-    AVCodecID id; ///< For PCM the 16-bit one; the sample size chooses.
-    const char* encoder;
-    int maxChannels;
-    double minBits;        ///< Least bits per sample and channel; 0: no limit.
-    double maxBits;        ///< Most bits per sample and channel; 0: no bit rate at all.
+    uint32_t code = 0;
+    AVCodecID id = AV_CODEC_ID_NONE; ///< For PCM the 16-bit one; the sample size chooses.
+    const char* encoder = nullptr;
+    int maxChannels = 8;
+    double minBits = 0;    ///< Least bits per sample and channel; 0: no limit.
+    double maxBits = 0;    ///< Most bits per sample and channel; 0: no bit rate at all.
     int maxSampleRate = 0; ///< 0: as the encoder tells itself.
     /// Loudspeakers that every decoder knows, ended by 0; null: as the encoder tells itself, or any.
     const uint64_t* layouts = nullptr;
@@ -106,22 +107,22 @@ enum ContainerWays : uint32_t {
 
 /// A file format.
 struct Container {
-    uint32_t code;
-    const char* name;
-    const char* extensions;
-    const char* muxer;
-    ContainerKind kind;
-    const char* options; ///< The multiplexer's own, as "name=value,...".
-    uint32_t carries;    ///< kWriterFormat... of what goes in beside pictures and sound.
-    const char* tags;    ///< Keys of the texts about the movie that are written, by commas; null: any.
-    int trackFlags;      ///< AV_DISPOSITION_... that are written, beside the default one.
+    uint32_t code = 0;
+    const char* name = nullptr;
+    const char* extensions = nullptr;
+    const char* muxer = nullptr;
+    ContainerKind kind = ContainerKind::kStreamed;
+    const char* options = nullptr; ///< The multiplexer's own, as "name=value,..."; null: none.
+    uint32_t carries = 0;          ///< kWriterFormat..., but for that of its kind.
+    const char* tags = nullptr; ///< Keys of the texts about the movie that are written, by commas; null: any.
+    int trackFlags = 0;         ///< AV_DISPOSITION_... that are written, beside the default one.
     /// FFmpeg's names of the codecs for subtitles that fit, that for any text first; null for none.
-    const char* subtitles;
+    const char* subtitles = nullptr;
     /// FFmpeg's names of the codecs for sound whose packets fit as they are; null for none.
-    const char* copiedSound;
-    uint32_t ways;                  ///< ContainerWays, together.
-    std::array<uint32_t, 12> video; ///< Codes of the codecs that fit, the default first, then zeros.
-    std::array<uint32_t, 12> audio;
+    const char* copiedSound = nullptr;
+    uint32_t ways = 0;                ///< ContainerWays, together.
+    std::array<uint32_t, 12> video{}; ///< Codes of the codecs that fit, the default first, then zeros.
+    std::array<uint32_t, 12> audio{};
 };
 
 /// Null when the code is not in the table.

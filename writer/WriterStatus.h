@@ -222,7 +222,11 @@ enum {
     kWriterFormatTimecode = 256,    ///< Carries a timecode, which is a text about the pictures: "timecode".
     /// Carries chapters as texts about the movie: "CHAPTER001", which is when it begins, "CHAPTER001NAME" ...
     kWriterFormatChapterTexts = 512,
-    kWriterFormatCoverText = 1024 ///< Carries what the cover is: MWDescribeCover.
+    kWriterFormatCoverText = 1024,         ///< Carries what the cover is: MWDescribeCover.
+    kWriterFormatNoPictureLanguage = 2048, ///< The languages that it carries are of sound and subtitles only.
+    kWriterFormatSmallPackets = 4096,      ///< All is cut into small packets, whose heads take room.
+    /// Holds E-AC-3 in frames of six blocks only: sound of shorter ones cannot be carried as it is.
+    kWriterFormatJoinsFrames = 8192
 };
 
 /// kWriterFormat... of the format with that code, together; 0 for one that is not in the table.

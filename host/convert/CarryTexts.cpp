@@ -4,7 +4,6 @@
 #include "host/convert/Timecode.h"
 #include "host/source/Languages.h"
 #include "host/source/MediaTime.h"
-#include "media/FourCC.h"
 #include "media/MediaRecords.h"
 #include "writer/WriterStatus.h"
 
@@ -89,9 +88,7 @@ std::vector<Tag> TextsOf(const StreamInfo& stream, const Request& request) {
 
 /// The stream's language by a code that the format can hold; empty when there is none.
 std::string LanguageIn(const FileFormatInfo& format, const StreamInfo& stream) {
-    // Transport streams tell the language of sound and subtitles only.
-    const bool hasNone = stream.kind == StreamKind::kPictures &&
-                         (format.fccFormat == FourCC("TS  ") || format.fccFormat == FourCC("M2TS"));
+    const bool hasNone = stream.kind == StreamKind::kPictures && Has(format, kWriterFormatNoPictureLanguage);
     if (stream.language.empty() || hasNone)
         return {};
     for (const std::string& code : CodesFor(stream.language))

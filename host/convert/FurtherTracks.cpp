@@ -8,11 +8,8 @@
 #include "host/source/Languages.h"
 #include "host/source/MediaTime.h"
 #include "host/source/SourceError.h"
-#include "media/FourCC.h"
 #include "media/MediaRecords.h"
 
-#include <algorithm>
-#include <array>
 #include <fmt/format.h>
 #include <new>
 
@@ -26,14 +23,12 @@ int TakeNext(void* context, int64_t until, int closing, WriterTrackItem* item) {
     return any ? 1 : 0;
 }
 
-/// Throws Failure for frames that MP4 and its like hold in another form: they join those of E-AC-3 that have
-/// fewer than six blocks of 256 samples.
+/// Throws Failure for frames of E-AC-3 with fewer than six blocks of 256 samples, which some formats join.
 void RequireHoldable(const AVCodecParameters& sound, const FileFormatInfo& format) {
     constexpr int kWholeFrame = 6 * 256;
-    constexpr std::array kJoining{FourCC("MP4 "), FourCC("MOV ")};
     const bool isPart =
         sound.codec_id == AV_CODEC_ID_EAC3 && sound.frame_size > 0 && sound.frame_size < kWholeFrame;
-    if (isPart && std::find(kJoining.begin(), kJoining.end(), format.fccFormat) != kJoining.end())
+    if (isPart && Has(format, kWriterFormatJoinsFrames))
         throw Failure(Category::kRequest,
                       fmt::format("{} cannot hold short frames of \"{}\" sound as it is; MKV can",
                                   ShortName(format), avcodec_get_name(sound.codec_id)));

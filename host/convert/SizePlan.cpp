@@ -8,6 +8,7 @@
 #include "host/convert/Formats.h"
 #include "media/FourCC.h"
 #include "media/Limits.h"
+#include "writer/WriterStatus.h"
 
 #include <algorithm>
 #include <cmath>
@@ -95,7 +96,7 @@ Request FitIntoSize(Request request, const SourceInfo& source) {
     const bool sound = source.sound && format.bHasAudio != 0;
     if (pictures && !QualityScaleOf(PictureCodecFor(request, format)))
         throw Failure(Category::kRequest, "a codec without a bit rate cannot keep below a size");
-    const bool packets = IsAmong(format.fccFormat, {FourCC("TS  "), FourCC("M2TS"), FourCC("MPG ")});
+    const bool packets = Has(format, kWriterFormatSmallPackets);
     const auto tracks = static_cast<double>(1 + CarryPlan(source, request, format).FurtherSound().size());
     const double packetRate = (pictures ? source.pictures->peakRate : 0) +
                               (sound ? tracks * source.sound->sampleRate / kSamplesPerPacket : 0);
