@@ -180,6 +180,7 @@ void SetTimes(PicturePlan& plan, const Container& container, const Carriage& car
               const VideoFormat& source, const WriterOptions& options) {
     plan.settings.inOrder = container.kind == ContainerKind::kSteadyRate;
     plan.clock = MakePictureClock(plan.settings.rate, container.kind == ContainerKind::kSteadyRate);
+    plan.mostRate = std::max(av_q2d(plan.clock.rate), double{source.dFrameRate});
     const double sourceRate = UsableRate(source.dFrameRate);
     const double rate = av_q2d(plan.settings.rate);
     plan.keepStamps = sourceRate > 0.0 && SameRate(rate, sourceRate) && options.bSteadyRate == 0 &&
@@ -256,43 +257,13 @@ std::vector<TrackPlan> MakeTrackPlans(const EncodeParam& param, const FilePlan& 
     return plans;
 }
 
-/// Bytes that the index of a plain file of the MP4 family takes when the movie is as long as its source; too
-/// few when it gets longer.
-int64_t IndexSize(const FilePlan& plan, const VideoFormat* video, const AudioFormat* audio,
-                  double fileLength) {
-    constexpr double kFixed = 4096;
-    constexpr double kPerPicture = 14;        // size, shift and a run of equal lengths
-    constexpr double kPerUnevenPicture = 22;  // and lengths of their own
-    constexpr double kPerPacket = 5;          // of sound
-    constexpr double kPerSecond = 60;         // chunks of both, key pictures
-    constexpr double kPerCue = 30;            // of subtitles, and one a second is many
-    constexpr double kSamplesPerPacket = 960; // the least of the usual ones
-    constexpr double kUnknown = 60;           // seconds
-    constexpr double kMost = 1e9;
-    double length = 0;
-    double perSecond = kPerSecond;
-    if (plan.pictures && video != nullptr) {
-        length = video->dDuration;
-        perSecond += (plan.pictures->keepStamps ? kPerUnevenPicture : kPerPicture) *
-                     std::max(av_q2d(plan.pictures->clock.rate),
-                              double{video->dFrameRate}); // copies: the records are packed
-    }
-    if (plan.sound) {
+/// Seconds that the file will last, about; 0 when that is not known.
+double ExpectedLength(const FilePlan& plan, const VideoFormat* video, const AudioFormat* audio,
+                      double fileLength) {
+    double length = plan.pictures ? double{video->dDuration} : 0; // copies: the records are packed
+    if (plan.sound || plan.soundBeside)
         length = std::max(length, double{audio->dDuration});
-        perSecond += kPerPacket * plan.sound->settings.sampleRate / kSamplesPerPacket;
-    }
-    if (plan.soundBeside)
-        length = std::max(length, double{audio->dDuration});
-    for (const TrackPlan& track : plan.tracks) {
-        const int rate = track.sound             ? track.sound->settings.sampleRate
-                         : IsSound(*track.track) ? track.track->parameters->sample_rate
-                                                 : 0;
-        perSecond += rate > 0 ? kPerPacket * rate / kSamplesPerPacket + kPerSecond / 2 : kPerCue;
-    }
-    if (fileLength > 0 && (length <= 0 || fileLength < length))
-        length = fileLength;
-    const double size = (length > 0 ? length : kUnknown) * perSecond;
-    return static_cast<int64_t>(kFixed + (size < kMost ? size : kMost));
+    return fileLength > 0 && (length <= 0 || fileLength < length) ? fileLength : length;
 }
 
 } // namespace
@@ -328,7 +299,7 @@ FilePlan MakeFilePlan(const EncodeParam& param, const VideoFormat* video, const 
                             "The format " + FormatText(param) + " cannot carry the sound as it is.");
     plan.bitExact = options.bBitExact != 0;
     plan.piece = options.nPiece;
-    plan.indexSize = IndexSize(plan, video, audio, options.dFileLength);
+    plan.length = ExpectedLength(plan, video, audio, options.dFileLength);
     return plan;
 }
 

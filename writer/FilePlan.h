@@ -30,6 +30,7 @@ struct PicturePlan {
     PictureClock clock;
     bool keepStamps;       ///< Every picture is shown once at its own time; otherwise a steady rate is made.
     int64_t pictureLength; ///< Usual length of a source picture in 100 ns units.
+    double mostRate;       ///< Pictures a second that can come, by the source's rate or by the file's.
     /// Of a piece: the tick of the picture shown before it, and when the first picture of the next piece
     /// comes.
     std::optional<int64_t> tickBefore;
@@ -60,9 +61,8 @@ struct FilePlan {
     bool soundBeside;              ///< The engine's sound does not go in, a track does.
     std::vector<TrackPlan> tracks; ///< Those that the container carries.
     bool bitExact;
-    int piece; ///< kWriterPiece...
-    /// Bytes that the index of a file of the MP4 family takes when it is as long as its source.
-    int64_t indexSize;
+    int piece;     ///< kWriterPiece...
+    double length; ///< Seconds that the file will last, about; 0: not known.
 
     /// Whether the file grows in fragments and gets one index when it is finished.
     bool Fragmented() const {

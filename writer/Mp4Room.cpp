@@ -80,11 +80,45 @@ private:
     const int64_t byte_;
 };
 
+// What the index takes at most, in bytes.
+constexpr double kFixed = 4096;
+constexpr double kPerPicture = 14;       // size, shift and a run of equal lengths
+constexpr double kPerUnevenPicture = 22; // and lengths of their own
+constexpr double kPerPacket = 5;         // of sound
+constexpr double kPerSecond = 60;        // chunks of both, key pictures
+constexpr double kPerCue = 30;           // of subtitles, and one a second is many
+
+double SoundBytesPerSecond(int sampleRate) {
+    constexpr double kSamplesPerPacket = 960; // the least of the usual ones
+    return kPerPacket * sampleRate / kSamplesPerPacket;
+}
+
+double TrackBytesPerSecond(const TrackPlan& track) {
+    const int rate = track.sound             ? track.sound->settings.sampleRate
+                     : IsSound(*track.track) ? track.track->parameters->sample_rate
+                                             : 0;
+    return rate > 0 ? SoundBytesPerSecond(rate) + kPerSecond / 2 : kPerCue;
+}
+
+int64_t IndexSize(const FilePlan& plan) {
+    constexpr double kUnknown = 60; // seconds
+    constexpr double kMost = 1e9;
+    double perSecond = kPerSecond;
+    if (plan.pictures)
+        perSecond += (plan.pictures->keepStamps ? kPerUnevenPicture : kPerPicture) * plan.pictures->mostRate;
+    if (plan.sound)
+        perSecond += SoundBytesPerSecond(plan.sound->settings.sampleRate);
+    for (const TrackPlan& track : plan.tracks)
+        perSecond += TrackBytesPerSecond(track);
+    const double size = (plan.length > 0 ? plan.length : kUnknown) * perSecond;
+    return static_cast<int64_t>(kFixed + (size < kMost ? size : kMost));
+}
+
 } // namespace
 
-int64_t RoomFor(int64_t bytes) {
+int64_t RoomFor(const FilePlan& plan, const Extras& extras) {
     // One byte of four counts up, so that it alone has to become 0.
-    const int64_t wanted = bytes + kLongHeaderSize + kHeaderSize;
+    const int64_t wanted = IndexSize(plan) + Mp4Index::MostOf(extras) + kLongHeaderSize + kHeaderSize;
     for (const int shift : {8, 16, 24}) {
         const int64_t steps = (wanted >> shift) + 1;
         // The multiplexer takes a signed size.

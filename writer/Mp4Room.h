@@ -11,6 +11,8 @@
 #ifndef MOVIECONV_WRITER_MP4ROOM_H
 #define MOVIECONV_WRITER_MP4ROOM_H
 
+#include "writer/Extras.h"
+#include "writer/FilePlan.h"
 #include "writer/FileSystem.h"
 #include "writer/Mp4Index.h"
 #include "writer/WriterFailure.h"
@@ -28,8 +30,8 @@ public:
         : WriterFailure(SystemFailure(kWriterErrorFinish, error, "Syncing the data failed")) {}
 };
 
-/// The size of a room in which that many bytes of index, and texts, fit.
-int64_t RoomFor(int64_t bytes);
+/// The size of the room for the index of a file that becomes as long as planned, and for its texts.
+int64_t RoomFor(const FilePlan& plan, const Extras& extras);
 
 class Mp4Room {
 public:

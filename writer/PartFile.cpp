@@ -37,7 +37,7 @@ PartFile::PartFile(const std::string& target, const FilePlan& plan, std::shared_
             std::move(file), [this](int64_t waiting) { return record_->AskAboutFullDisk(waiting); });
         AvioFile::Tap tap;
         if (plan.Fragmented()) {
-            room_.emplace(RoomFor(plan.indexSize + Mp4Index::MostOf(*record_->ExtraParts())));
+            room_.emplace(RoomFor(plan, *record_->ExtraParts()));
             tap = [this, made = file.get()](int64_t position, const uint8_t* data, int64_t size) {
                 fragments_.Take(position, data, size);
                 return room_->Close(*made);
