@@ -1,6 +1,7 @@
 #include "host/convert/ClipCutter.h"
 
 #include "host/source/MediaTime.h"
+#include "host/source/SoundBlock.h"
 #include "host/source/SourceTime.h"
 
 #include <algorithm>
@@ -96,11 +97,7 @@ bool ClipCutter::MakeSilence() {
     if (samples <= 0)
         return false;
     silence_.assign(static_cast<std::size_t>(samples * FrameBytes(format)), 0);
-    left_ = {};
-    left_.nType = kMediaTypeSilence;
-    left_.nSampleRate = format.nSampleRate;
-    left_.nChannels = format.nChannels;
-    left_.nBitsPerSample = format.nBitsPerSample;
+    left_ = BlockOf(format, kMediaTypeSilence);
     left_.pData = silence_.data();
     left_.nLength = left_.nBufferSize = static_cast<int32_t>(silence_.size());
     return true;

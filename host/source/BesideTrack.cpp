@@ -1,6 +1,7 @@
 #include "host/source/BesideTrack.h"
 
 #include "host/source/PacketTime.h"
+#include "host/source/SoundBlock.h"
 
 #include <algorithm>
 #include <iterator>
@@ -51,7 +52,7 @@ bool BesideSound::Find(int64_t until, bool closing, Item& item) {
     const AudioFormat& format = decoder_.Format();
     int64_t samples = current_.samples - used_;
     if (until != BesideBounds::kOpen) {
-        const int64_t end = av_rescale(until - bounds_.begin, format.nSampleRate, kTicksPerSecond);
+        const int64_t end = SamplesIn(until - bounds_.begin, format.nSampleRate);
         samples = std::min(samples, end - position_);
     }
     if (samples <= 0)
@@ -89,15 +90,11 @@ void BesideSound::HandOut(int64_t samples, Item& item) {
     const auto bytes = static_cast<std::size_t>(samples * decoder_.FrameBytes());
     if (isSilence)
         silence_.resize(std::max(silence_.size(), bytes));
-    block_ = {};
-    block_.nType = kMediaTypeSound;
-    block_.nSampleRate = format.nSampleRate;
-    block_.nChannels = format.nChannels;
-    block_.nBitsPerSample = format.nBitsPerSample;
+    block_ = BlockOf(format, kMediaTypeSound);
     block_.pData = isSilence ? silence_.data() : current_.sound.data() + used_ * decoder_.FrameBytes();
     block_.nLength = block_.nBufferSize = static_cast<int32_t>(bytes);
-    block_.llTime = bounds_.begin + av_rescale(position_, kTicksPerSecond, format.nSampleRate);
-    block_.nDuration = static_cast<int32_t>(av_rescale(samples, kTicksPerSecond, format.nSampleRate));
+    block_.llTime = bounds_.begin + TimeOfSamples(position_, format.nSampleRate);
+    block_.nDuration = static_cast<int32_t>(TimeOfSamples(samples, format.nSampleRate));
     item = {&block_, nullptr, block_.llTime, block_.nDuration};
     position_ += samples;
     used_ += samples;

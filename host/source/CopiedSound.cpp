@@ -1,7 +1,7 @@
 #include "host/source/CopiedSound.h"
 
 #include "host/source/CodedSound.h"
-#include "host/source/MediaTime.h"
+#include "host/source/SoundBlock.h"
 #include "host/source/SourceError.h"
 
 extern "C" {
@@ -262,11 +262,11 @@ int64_t CopiedSound::Samples(const AVPacket& packet) {
 }
 
 int64_t CopiedSound::SamplesAt(int64_t time) const {
-    return av_rescale(time, parameters_->sample_rate, kTicksPerSecond);
+    return SamplesIn(time, parameters_->sample_rate);
 }
 
 int64_t CopiedSound::TimeOf(int64_t samples) const {
-    return av_rescale(samples, kTicksPerSecond, parameters_->sample_rate);
+    return TimeOfSamples(samples, parameters_->sample_rate);
 }
 
 } // namespace movieconv

@@ -1,6 +1,6 @@
 #include "host/source/PcmDecoder.h"
 
-#include "host/source/MediaTime.h"
+#include "host/source/SoundBlock.h"
 
 #include <algorithm>
 #include <utility>
@@ -59,7 +59,7 @@ bool PcmDecoder::Decode(const AVPacket* packet) {
 bool PcmDecoder::FillTo(int64_t time) {
     if (doubted_ && doubted_->stamp <= time) { // the others have come there, too
         const int64_t samples = static_cast<int64_t>(doubted_->chunk.size()) / frameBytes_;
-        if (!PushDoubted(doubted_->stamp + av_rescale(samples, kTicksPerSecond, format_.nSampleRate)))
+        if (!PushDoubted(doubted_->stamp + TimeOfSamples(samples, format_.nSampleRate)))
             return false;
     }
     const int64_t samples = timeline_->FillTo(time);

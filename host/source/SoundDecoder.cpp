@@ -1,6 +1,7 @@
 #include "host/source/SoundDecoder.h"
 
 #include "host/source/MediaTime.h"
+#include "host/source/SoundBlock.h"
 #include "host/source/SourceTime.h"
 
 #include <algorithm>
@@ -77,11 +78,7 @@ AudioFrame* SoundDecoder::GetNextFrame() {
     const int64_t left = static_cast<int64_t>(current_.size()) - used_;
     const int64_t bytes = std::min(left, blockBytes_);
     const AudioFormat& format = info_.format;
-    block_ = {};
-    block_.nType = kMediaTypeSound;
-    block_.nSampleRate = format.nSampleRate;
-    block_.nChannels = format.nChannels;
-    block_.nBitsPerSample = format.nBitsPerSample;
+    block_ = BlockOf(format, kMediaTypeSound);
     block_.pData = current_.data() + used_;
     block_.nLength = static_cast<int32_t>(bytes);
     block_.nBufferSize = static_cast<int32_t>(left);
@@ -89,8 +86,7 @@ AudioFrame* SoundDecoder::GetNextFrame() {
         begin_ + av_rescale_rnd(samplesDelivered_, kTicksPerSecond, format.nSampleRate,
                                 AV_ROUND_DOWN); // as the writer
     TellSourceTime(block_.reserved, block_.llTime);
-    block_.nDuration =
-        static_cast<int32_t>(av_rescale(bytes / frameBytes_, kTicksPerSecond, format.nSampleRate));
+    block_.nDuration = static_cast<int32_t>(TimeOfSamples(bytes / frameBytes_, format.nSampleRate));
     used_ += bytes;
     samplesDelivered_ += bytes / frameBytes_;
     return &block_;

@@ -1,18 +1,14 @@
 #include "host/source/SoundTimeline.h"
 
-#include "host/source/MediaTime.h"
+#include "host/source/SoundBlock.h"
 
 #include <algorithm>
 #include <cstdlib>
 
-extern "C" {
-#include <libavutil/mathematics.h>
-}
-
 namespace movieconv {
 
 int64_t SoundTimeline::OffsetOf(int64_t stamp) const {
-    return av_rescale(stamp - begin_, sampleRate_, kTicksPerSecond) - position_;
+    return SamplesIn(stamp - begin_, sampleRate_) - position_;
 }
 
 bool SoundTimeline::NeedsWitness(std::optional<int64_t> stamp) const {
@@ -37,8 +33,7 @@ SoundTimeline::Placement SoundTimeline::Place(std::optional<int64_t> stamp, int6
 }
 
 int64_t SoundTimeline::FillTo(int64_t time) {
-    const int64_t silence =
-        std::max<int64_t>(av_rescale(time - begin_, sampleRate_, kTicksPerSecond) - position_, 0);
+    const int64_t silence = std::max<int64_t>(OffsetOf(time), 0);
     position_ += silence;
     return silence;
 }
