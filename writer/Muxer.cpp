@@ -174,29 +174,38 @@ void Muxer::Write(AVPacket& packet, int stream) {
     if (container_.kind == ContainerKind::kSteadyRate && HasPictures(*output_) && IsRunUp(packet, *out))
         return;
     av_packet_move_ref(packet_.get(), &packet);
-    av_packet_rescale_ts(packet_.get(), state.unit, out->time_base);
-    packet_->pts += state.delay;
-    packet_->dts += state.delay;
-    // A coarse unit can make two times equal. Many texts may be shown at one time.
-    const int64_t step = state.sparse && extras_.IsMatroska() ? 0 : 1;
-    if (state.lastDts != AV_NOPTS_VALUE && packet_->dts < state.lastDts + step) {
-        packet_->dts = state.lastDts + step;
-        packet_->pts = std::max(packet_->pts, packet_->dts);
-    }
-    state.lastDts = packet_->dts;
     packet_->stream_index = stream;
+    SetTimes(*packet_, state, out->time_base);
     const int64_t time = av_rescale_q(packet_->dts, out->time_base, av_get_time_base_q());
-    output_->max_interleave_delta = MostApart(packet_->size);
     const int counted = IsEmptyText(*packet_, out->codecpar->codec_id) ? 0 : 1;
-    // A cover never gets a second packet, for which the multiplexer would wait.
-    const bool alone = extras_.HasCoverStream() && streams_.size() == 1;
-    Check(alone ? av_write_frame(output_.get(), packet_.get())
-                : av_interleaved_write_frame(output_.get(), packet_.get()),
-          "refuses a packet");
-    av_packet_unref(packet_.get());
+    Interleave(*packet_);
     state.packets += counted;
     NoteWhole();
     FlushNowAndThen(time);
+}
+
+/// In the file's unit; those of decoding rise.
+void Muxer::SetTimes(AVPacket& packet, State& state, AVRational unit) const {
+    av_packet_rescale_ts(&packet, state.unit, unit);
+    packet.pts += state.delay;
+    packet.dts += state.delay;
+    // A coarse unit can make two times equal. Many texts may be shown at one time.
+    const int64_t step = state.sparse && extras_.IsMatroska() ? 0 : 1;
+    if (state.lastDts != AV_NOPTS_VALUE && packet.dts < state.lastDts + step) {
+        packet.dts = state.lastDts + step;
+        packet.pts = std::max(packet.pts, packet.dts);
+    }
+    state.lastDts = packet.dts;
+}
+
+/// Hands it to the multiplexer, which writes it when no other stream can have an earlier one.
+void Muxer::Interleave(AVPacket& packet) {
+    output_->max_interleave_delta = MostApart(packet.size);
+    // A cover never gets a second packet, for which the multiplexer would wait.
+    const bool alone = extras_.HasCoverStream() && streams_.size() == 1;
+    Check(alone ? av_write_frame(output_.get(), &packet) : av_interleaved_write_frame(output_.get(), &packet),
+          "refuses a packet");
+    av_packet_unref(&packet);
 }
 
 void Muxer::WriteAt(AVPacket& packet, int64_t position) {

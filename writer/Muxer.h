@@ -88,6 +88,8 @@ private:
     void Check(int result, const char* what) const;
     void SetOptions(int64_t room);
     void SetDelays();
+    void SetTimes(AVPacket& packet, State& state, AVRational unit) const;
+    void Interleave(AVPacket& packet);
     void TellLastStay();
     int64_t MostApart(int packetSize);
     int64_t LeastLag() const;
