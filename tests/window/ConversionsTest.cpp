@@ -99,110 +99,95 @@ TEST_F(ConversionsTest, TellsWhatGoesWrongInWords) {
     EXPECT_TRUE(At(1).unusable.contains(QStringLiteral("connected")));
 }
 
-TEST_F(ConversionsTest, CarriesTheTracksThatAreChosen) {
-    WriteFile(folder / "a.srt", "1\n00:00:00,500 --> 00:00:01,500\nGrüße\n");
-    const std::string movie = test_movies::Make("window-tracks.mkv", {"-f",
-                                                                      "lavfi",
-                                                                      "-i",
-                                                                      "testsrc2=s=320x180:r=25",
-                                                                      "-f",
-                                                                      "lavfi",
-                                                                      "-i",
-                                                                      "sine=440",
-                                                                      "-f",
-                                                                      "lavfi",
-                                                                      "-i",
-                                                                      "sine=880",
-                                                                      "-i",
-                                                                      folder / "a.srt",
-                                                                      "-map",
-                                                                      "0",
-                                                                      "-map",
-                                                                      "1",
-                                                                      "-map",
-                                                                      "2",
-                                                                      "-map",
-                                                                      "3",
-                                                                      "-t",
-                                                                      "2",
-                                                                      "-c:v",
-                                                                      "libx264",
-                                                                      "-preset",
-                                                                      "ultrafast",
-                                                                      "-c:a",
-                                                                      "aac",
-                                                                      "-c:s",
-                                                                      "srt",
-                                                                      "-metadata:s:a:0",
-                                                                      "language=eng",
-                                                                      "-metadata:s:a:1",
-                                                                      "language=ger",
-                                                                      "-metadata:s:s:0",
-                                                                      "language=fre"});
-    queue.SetNaming({QStringLiteral("{name}"), folder.Path()});
-    queue.Add({movie});
-    AwaitExamined(1);
-    ASSERT_EQ(At(0).facts->sounds.size(), 2U);
-    EXPECT_EQ(TrackLine(At(0).facts->sounds[1]), "German (AAC, mono)");
-    EXPECT_TRUE(At(0).findings.notes.isEmpty()) << At(0).findings.notes.join("; ").toStdString();
+namespace {
+
+/// A movie with an English and a German sound and French subtitles, and a file of subtitles beside it.
+struct TracksTest : ConversionsTest {
+    void SetUp() override {
+        WriteFile(Texts(), "1\n00:00:00,500 --> 00:00:01,500\nGrüße\n");
+        queue.SetNaming({QStringLiteral("{name}"), folder.Path()});
+        queue.Add({test_movies::Make(
+            "window-tracks.mkv",
+            test_movies::Join(
+                test_movies::Words("-f lavfi -i testsrc2=s=320x180:r=25 -f lavfi -i sine=440 "
+                                   "-f lavfi -i sine=880"),
+                test_movies::Args{"-i", Texts()},
+                test_movies::Words("-map 0 -map 1 -map 2 -map 3 -t 2 -c:v libx264 -preset "
+                                   "ultrafast -c:a aac -c:s srt -metadata:s:a:0 language=eng "
+                                   "-metadata:s:a:1 language=ger -metadata:s:s:0 language=fre")))});
+        AwaitExamined(1);
+        wishes.subtitleFiles = {{Texts(), QStringLiteral("de")}};
+        ASSERT_EQ(At(0).facts->sounds.size(), 2U);
+    }
+
+    std::string Texts() const { return folder / "a.srt"; }
+
+    void Choose() {
+        queue.SetWishes(At(0).id, wishes);
+        AwaitExamined(1);
+    }
+
+    /// What the movie became.
+    MovieFacts Converted() {
+        dispatcher.Start();
+        EXPECT_TRUE(AwaitDone());
+        EXPECT_EQ(At(0).state, State::kDone) << At(0).outcome.sentence.toStdString();
+        return runner.Look(At(0).target);
+    }
 
     Wishes wishes;
+};
+
+} // namespace
+
+TEST_F(TracksTest, AreTheFilesUnlessItsFormatHoldsLess) {
+    EXPECT_EQ(TrackLine(At(0).facts->sounds[1]), "German (AAC, mono)");
+    EXPECT_TRUE(At(0).findings.notes.isEmpty()) << At(0).findings.notes.join("; ").toStdString();
     wishes.format = QStringLiteral("flv"); // holds one sound and no subtitles
-    wishes.subtitleFiles = {{folder / "a.srt", QStringLiteral("de")}};
-    queue.SetWishes(At(0).id, wishes);
-    AwaitExamined(1);
+    Choose();
     const QString notes = At(0).findings.notes.join(QLatin1Char('\n'));
     for (const char* told : {"sound 2 (AAC, German)", "subtitles 3 (SRT, French)", "subtitles (SRT, German)"})
         EXPECT_TRUE(notes.contains(QLatin1String(told))) << notes.toStdString();
     EXPECT_TRUE(At(0).findings.warnings.isEmpty());
+}
 
+TEST_F(TracksTest, AreThoseThatAreChosen) {
     wishes.format = QStringLiteral("mkv");
     wishes.sounds = QList<int>{At(0).facts->sounds[1].number};
     wishes.subtitles = QList<int>{};
     wishes.title = QStringLiteral("Mine");
-    queue.SetWishes(At(0).id, wishes);
-    AwaitExamined(1);
+    Choose();
     EXPECT_TRUE(At(0).findings.notes.isEmpty()) << At(0).findings.notes.join("; ").toStdString();
-    dispatcher.Start();
-    ASSERT_TRUE(AwaitDone());
-    ASSERT_EQ(At(0).state, State::kDone) << At(0).outcome.sentence.toStdString();
-    const MovieFacts made = runner.Look(At(0).target);
+    const MovieFacts made = Converted();
     ASSERT_EQ(made.sounds.size(), 1U);
     EXPECT_EQ(made.sounds[0].language, "ger");
     ASSERT_EQ(made.subtitles.size(), 1U);
     EXPECT_EQ(made.subtitles[0].language, "ger");
     EXPECT_EQ(made.title, "Mine");
+}
 
-    queue.Retry({At(0).id});
-    AwaitExamined(1);
+TEST_F(TracksTest, AreCopiedOrDrawn) {
+    wishes.format = QStringLiteral("mkv");
+    wishes.sounds = QList<int>{At(0).facts->sounds[1].number};
     wishes.copySound = true;
     wishes.channels = 1;
-    wishes.subtitles.reset();
     Burn(wishes, {At(0).facts->subtitles[0].number, {}});
-    queue.SetWishes(At(0).id, wishes);
-    AwaitExamined(1);
+    Choose();
     EXPECT_EQ(At(0).findings.notes, QStringList{"The sound stays as it is, and so do its channels."});
-    dispatcher.Start();
-    ASSERT_TRUE(AwaitDone());
-    ASSERT_EQ(At(0).state, State::kDone) << At(0).outcome.sentence.toStdString();
+    const MovieFacts kept = Converted();
     EXPECT_TRUE(At(0).outcome.notCarried.isEmpty());
-    const MovieFacts kept = runner.Look(At(0).target);
     ASSERT_EQ(kept.sounds.size(), 1U);
     EXPECT_EQ(kept.sounds[0].details, "AAC, mono");
     ASSERT_EQ(kept.subtitles.size(), 1U) << "the file, but not the track that is drawn";
     EXPECT_EQ(kept.subtitles[0].language, "ger");
+}
 
-    queue.Retry({At(0).id});
-    wishes.copySound.reset();
-    wishes.channels.reset();
-    Burn(wishes, {});
-    wishes.subtitles = QList<int>{};
+TEST_F(TracksTest, ThatAreNotThereAreWarnedOf) {
     wishes.sounds = QList<int>{17}; // the file is another one now
     wishes.subtitleFiles[0].path = folder / "gone.srt";
     wishes.depth = 10;
     wishes.format = QStringLiteral("flv");
-    queue.SetWishes(At(0).id, wishes);
-    AwaitExamined(1);
+    Choose();
     EXPECT_EQ(At(0).findings.warnings.size(), 2) << At(0).findings.warnings.join("; ").toStdString();
 }
 
