@@ -36,6 +36,7 @@ struct ReadChapter {
 /// What a reader finds in a file.
 struct ReadExtras {
     std::map<std::string, std::string> tags;
+    std::string pictureLanguage;
     std::string soundLanguage;
     int soundFlags = 0;
     std::vector<ReadChapter> chapters;
@@ -72,6 +73,8 @@ ReadExtras ReadExtrasOf(const std::string& path) {
             read.cover.assign(stream.attached_pic.data, stream.attached_pic.data + stream.attached_pic.size);
             read.coverText = Value(stream.metadata, "title");
             read.coverFile = Value(stream.metadata, "filename");
+        } else if (parameters.codec_type == AVMEDIA_TYPE_VIDEO) {
+            read.pictureLanguage = Value(stream.metadata, "language");
         } else if (parameters.codec_type == AVMEDIA_TYPE_ATTACHMENT)
             read.attachments[Value(stream.metadata, "filename")].assign(
                 parameters.extradata, parameters.extradata + parameters.extradata_size);
@@ -92,6 +95,7 @@ void Fill(uint32_t set) {
     ASSERT_EQ(MWSetTag(set, "artist", "Somebody"), 1);
     ASSERT_EQ(MWSetTag(set, "comment", "gone"), 1);
     ASSERT_EQ(MWSetTag(set, "comment", nullptr), 1);
+    ASSERT_EQ(MWSetTrackTag(set, 0, "language", "fre"), 1);
     ASSERT_EQ(MWSetTrackTag(set, 1, "language", "eng"), 1);
     ASSERT_EQ(MWAddChapter(set, 0, kSecond / 2, "One"), 1);
     ASSERT_EQ(MWAddChapter(set, kSecond / 2, 3 * kSecond / 2, "Zwei – ü"), 1);
@@ -143,6 +147,10 @@ TEST_F(Extras, AreInEachFormatAsFarAsItCarriesThem) {
             EXPECT_EQ(read.chapters[1].title, "Zwei – ü");
             EXPECT_EQ(read.chapters[2].title, "");
         }
+        const bool tellsOfPictures = (traits & (kWriterFormatLanguages | kWriterFormatNoPictureLanguage)) ==
+                                         uint32_t{kWriterFormatLanguages} &&
+                                     movie_.hasVideo;
+        EXPECT_EQ(read.pictureLanguage, tellsOfPictures ? "fre" : "");
         EXPECT_EQ(read.cover, (traits & kWriterFormatCover) != 0 ? kJpeg : "");
         EXPECT_EQ(read.coverText, (traits & kWriterFormatCoverText) != 0 ? "Die Brücke" : "");
         EXPECT_EQ(read.coverFile, (traits & kWriterFormatAttachments) != 0 ? "front.jpg" : "");
