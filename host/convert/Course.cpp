@@ -19,7 +19,6 @@
 #include <chrono>
 #include <cmath>
 #include <cstring>
-#include <filesystem>
 #include <fmt/format.h>
 #include <limits>
 #include <string_view>
@@ -30,14 +29,6 @@ namespace {
 
 constexpr std::chrono::milliseconds kShortestInterval{100}; // between two reports of progress
 constexpr double kLeastLength = 0.0011;                     // seconds: less means all the rest to the engine
-constexpr double kEarlyEnd = 1; // seconds by which a source may fall short of the length asked for
-
-/// Whether the file is shorter than when it was opened.
-bool HasShrunk(const SourceInfo& source) {
-    std::error_code unknown;
-    const auto bytes = std::filesystem::file_size(source.path, unknown);
-    return !unknown && static_cast<int64_t>(bytes) < source.bytes;
-}
 
 /// Of a piece the plan knows it better than the source.
 double LengthOf(const Request& request, const SourceInfo& source) {
@@ -324,9 +315,13 @@ Verdict Course::Conclude() {
     ReportComplaints();
     for (const NotCarried& lost : LostCues(subtitles_, watch_.OptionSet()))
         observer_.LeftBehind(lost);
+    const std::string shortfall =
+        outcome_ == kOutcomeCompleted
+            ? WhyItEndedEarly(movie_, request_, std::max(Position(), movie_.SoundSeconds()))
+            : std::string();
     Verdict verdict;
-    verdict.failure = FindFailure({request_, files_, brokenOff_, movie_.ReadError(), WhyItEndedEarly(),
-                                   userStopped_, outcome_, request_.begin + Position()});
+    verdict.failure = FindFailure({request_, files_, brokenOff_, movie_.ReadError(), shortfall, userStopped_,
+                                   outcome_, request_.begin + Position()});
     verdict.outcome = verdict.failure                               ? Outcome::kFailed
                       : userStopped_ && outcome_ == kOutcomeStopped ? Outcome::kStopped
                                                                     : Outcome::kDone;
@@ -340,22 +335,6 @@ Verdict Course::Conclude() {
         if (const std::optional<Warning> older = OlderClips(request_.output, files_.Opened()))
             observer_.Warned(*older);
     return verdict;
-}
-
-/// Why the source ended before what it promises, and before the length that was asked for; empty when it did
-/// not.
-std::string Course::WhyItEndedEarly() const {
-    const std::optional<Shortfall> missing = movie_.Missing();
-    const double converted = std::max(Position(), movie_.SoundSeconds());
-    const bool lengthReached = request_.length && *request_.length - converted <= kEarlyEnd;
-    if (!missing || lengthReached || outcome_ != kOutcomeCompleted)
-        return {};
-    if (HasShrunk(movie_.Info()))
-        return "the file was cut meanwhile";
-    if (missing->announced <= 0)
-        return "it is cut off";
-    return fmt::format("{}it ends at {} although it announces {}", missing->cutOff ? "it is cut off: " : "",
-                       FormatTime(missing->reached, true), FormatTime(missing->announced, true));
 }
 
 void Course::ReportComplaints() {

@@ -76,7 +76,6 @@ private:
     double Position() const;
     double Converted(double position) const;
     double Reached() const;
-    std::string WhyItEndedEarly() const;
     void ReportComplaints();
 
     const Request request_; // with rates by the greatest size

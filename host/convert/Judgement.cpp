@@ -3,10 +3,21 @@
 #include "api/MovieConv.h"
 #include "host/convert/Amounts.h"
 
+#include <filesystem>
 #include <fmt/format.h>
+#include <system_error>
 
 namespace movieconv {
 namespace {
+
+constexpr double kEarlyEnd = 1; // seconds by which a source may fall short of the length asked for
+
+/// Whether the file is shorter than when it was opened.
+bool HasShrunk(const SourceInfo& source) {
+    std::error_code unknown;
+    const auto bytes = std::filesystem::file_size(source.path, unknown);
+    return !unknown && static_cast<int64_t>(bytes) < source.bytes;
+}
 
 /// Without a complete file, of which the writer keeps none that is empty.
 std::optional<Failure> WhyNothingIsThere(const Evidence& evidence) {
@@ -19,6 +30,19 @@ std::optional<Failure> WhyNothingIsThere(const Evidence& evidence) {
 }
 
 } // namespace
+
+std::string WhyItEndedEarly(const Movie& movie, const Request& request, double reached) {
+    const std::optional<Shortfall> missing = movie.Missing();
+    const bool lengthReached = request.length && *request.length - reached <= kEarlyEnd;
+    if (!missing || lengthReached)
+        return {};
+    if (HasShrunk(movie.Info()))
+        return "the file was cut meanwhile";
+    if (missing->announced <= 0)
+        return "it is cut off";
+    return fmt::format("{}it ends at {} although it announces {}", missing->cutOff ? "it is cut off: " : "",
+                       FormatTime(missing->reached, true), FormatTime(missing->announced, true));
+}
 
 std::optional<Failure> FindExcess(const Request& request, const FileLedger& files) {
     if (!request.maxSize || files.Bytes() <= *request.maxSize)

@@ -4,6 +4,7 @@
 
 #include "host/convert/FileLedger.h"
 #include "host/convert/Request.h"
+#include "host/source/Movie.h"
 
 #include <optional>
 #include <string>
@@ -21,6 +22,10 @@ struct Evidence {
     int engineOutcome = 0; ///< kOutcome...
     double reached = 0;    ///< Seconds, in the source.
 };
+
+/// Why the source ended before what it promises, and before the length that was asked for, of which so many
+/// seconds were reached; empty when it did not. Once the movie's streams ended.
+std::string WhyItEndedEarly(const Movie& movie, const Request& request, double reached);
 
 /// Whether the files have become larger than the request allows.
 std::optional<Failure> FindExcess(const Request& request, const FileLedger& files);

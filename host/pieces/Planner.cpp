@@ -1,10 +1,12 @@
 #include "host/pieces/Planner.h"
 
 #include "api/MovieConv.h"
+#include "host/convert/Amounts.h"
 #include "host/convert/CodecPlan.h"
 #include "host/convert/EncodePlan.h"
 #include "host/convert/Engine.h"
 #include "host/convert/Failure.h"
+#include "host/convert/Judgement.h"
 #include "host/convert/SizePlan.h"
 #include "host/convert/Sources.h"
 #include "host/convert/WriterPlan.h"
@@ -60,6 +62,26 @@ Request StampRequest(const Plan& plan) {
     return request;
 }
 
+/// Throws Failure where pieces would, after much work.
+void RequireAll(const Movie& movie, const Request& request, const Stamps& stamps) {
+    const std::string& path = request.input;
+    if (const std::string error = movie.ReadError(); !error.empty())
+        throw Failure(Category::kSource, fmt::format("reading \"{}\" failed: {}", path, error));
+    if (movie.UnstampedPictures() > 0)
+        throw Failure(
+            Category::kSource,
+            fmt::format("\"{}\" does not tell when its pictures are shown; it can only be converted "
+                        "undivided",
+                        path));
+    if (stamps.times.empty())
+        throw Failure(Category::kSource, fmt::format("\"{}\" holds no pictures to convert", path));
+    const double reached = ToSeconds(stamps.end) - request.begin;
+    if (const std::string why = WhyItEndedEarly(movie, request, reached); !why.empty())
+        throw Failure(Category::kSource,
+                      fmt::format("reading \"{}\" failed after {}: {}; it can only be converted undivided",
+                                  path, FormatTime(ToSeconds(stamps.end), true), why));
+}
+
 std::optional<Stamps> ReadStamps(Movie& movie, const Request& request, const std::function<bool()>& stopped) {
     constexpr std::size_t kAskEvery = 4096;
     VideoDecoder& pictures = *movie.Pictures();
@@ -79,17 +101,7 @@ std::optional<Stamps> ReadStamps(Movie& movie, const Request& request, const std
     if (request.length)
         stamps.end = std::min(stamps.end, ToMediaTime(request.begin + *request.length));
     stamps.clockJumps = movie.ClockJumps() > 0;
-    const std::string& path = request.input;
-    if (const std::string error = movie.ReadError(); !error.empty())
-        throw Failure(Category::kSource, fmt::format("reading \"{}\" failed: {}", path, error));
-    if (movie.UnstampedPictures() > 0)
-        throw Failure(
-            Category::kSource,
-            fmt::format("\"{}\" does not tell when its pictures are shown; it can only be converted "
-                        "undivided",
-                        path));
-    if (stamps.times.empty())
-        throw Failure(Category::kSource, fmt::format("\"{}\" holds no pictures to convert", path));
+    RequireAll(movie, request, stamps);
     return stamps;
 }
 

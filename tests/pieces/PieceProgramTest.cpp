@@ -159,6 +159,9 @@ TEST(Pieces, ArePlannedOfNothingThatCannotBeReadTwice) {
     const std::string bare = test_movies::Make(
         "bare.h264", test_movies::Join(test_movies::CountedPictures(2), Args{"-c:v", "libx264", "-bf", "2"}));
     refuses({bare, folder / "out.mp4"}, kCannotRead, "only be converted undivided");
+    const std::string cut = folder / "cut.mkv";
+    WriteFile(cut, ReadFile(Source()).substr(0, ReadFile(Source()).size() / 2));
+    refuses({cut, folder / "out.mp4"}, kCannotRead, "it is cut off");
     refuses({Source(), folder / "out.m4a"}, kUsage, "sound alone");
     refuses({Source(), folder / "out.gif"}, kUsage, "a GIF");
     refuses({"--split", "2", Source(), folder / "out.mp4"}, kUsage, "clips");
