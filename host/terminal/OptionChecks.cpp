@@ -65,21 +65,12 @@ void CheckRequest(const Request& request) {
     const bool rated = request.quality || request.videoRate || request.audioRate;
     const bool changesSound =
         request.channels || request.sampleRate || request.audioRate || request.audioMaxRate;
-    const bool changesPictures = request.videoCodec || request.size || request.detectCrop ||
-                                 !request.crop.CutsNothing() || request.depth || request.frameRate ||
-                                 request.quality || request.videoRate || request.videoMaxRate;
     BurnWish burnt;
     burnt.what = request.burnSubtitles;
     const bool readsText =
         !request.subtitleFiles.empty() || (!request.burnSubtitles.empty() && !NamesStream(burnt));
     Require({
         {request.noVideo && silent, "--no-video and --no-audio together leave nothing to convert"},
-        {request.noVideo && changesPictures,
-         "--no-video leaves the pictures out: it excludes --video-codec, --size, --crop, --depth, "
-         "--frame-rate, --quality, --video-rate and --video-max-rate"},
-        {request.noAudio && (changesSound || request.audioCodec || request.copySound),
-         "--no-audio leaves the sound out: it excludes --audio-codec, --channels, --sample-rate, "
-         "--audio-rate and --audio-max-rate"},
         {request.videoRate && request.videoMaxRate && *request.videoMaxRate < *request.videoRate,
          "--video-max-rate must be at least --video-rate"},
         {request.audioRate && request.audioMaxRate && *request.audioMaxRate < *request.audioRate,

@@ -14,15 +14,26 @@ namespace {
 
 struct KnownTask {
     const char* option;
-    std::vector<std::string> headings; // of the options that it takes
+    std::vector<std::string> headings;     // of the options that it takes
+    std::vector<std::string> further = {}; // such options under other headings
+};
+
+struct Omission {
+    const char* option;
+    const char* value;
+    const char* claim;
+    const char* heading;              // of the options that have no effect then
+    std::vector<std::string> further; // such options under other headings
+    std::vector<std::string> spared;  // options under the heading that have one
 };
 
 const KnownTask* FindTask(const CLI::Option& option) {
     using namespace heading;
     static const std::vector<KnownTask> kTasks{
-        {"--plan", {kRange, kEncoding, kPictures, kSound, kPieces, kCarried, kOutput, kReports}},
-        {"--piece", {kPieces, kOutput, kReports}}, // what is converted, and to what, stands in the plan
-        {"--join", {kPieces, kOutput, kReports}},
+        {"--plan", {kRange, kEncoding, kPictures, kSound, kPieces, kCarried, kReports}, {"--overwrite"}},
+        // What is converted, and to what, stands in the plan.
+        {"--piece", {kPieces, kReports}, {"--overwrite", "--on-full"}},
+        {"--join", {kPieces, kReports}, {"--overwrite", "--on-full"}},
         {"--info", {kRange, kEncoding, kPictures, kCarried, kOutput, kReports}},
         {"--estimate", {kRange, kEncoding, kPictures, kSound, kMany, kPieces, kCarried, kOutput, kReports}},
         {"--list-formats", {kOutput, kReports}},
@@ -43,6 +54,52 @@ std::vector<const CLI::Option*> GivenOptions(const CLI::App& app) {
     throw Failure(Category::kRequest, text);
 }
 
+bool Holds(const std::vector<std::string>& list, const std::string& entry) {
+    return std::find(list.begin(), list.end(), entry) != list.end();
+}
+
+bool Takes(const KnownTask& task, const CLI::Option& option) {
+    return option.get_positional() || FindTask(option) != nullptr ||
+           Holds(task.headings, option.get_group()) || Holds(task.further, option.get_name());
+}
+
+/// Refuses what says how to make the pictures or the sound when they are left out.
+void CheckOmissions(const std::vector<const CLI::Option*>& given) {
+    static const std::vector<Omission> kOmissions{
+        {"--no-video",
+         "true",
+         "--no-video leaves the pictures out",
+         heading::kPictures,
+         {"--video-codec", "--preview"},
+         {"--max-size"}},
+        {"--no-audio",
+         "true",
+         "--no-audio leaves the sound out",
+         heading::kSound,
+         {"--audio-codec", "--audio-tracks"},
+         {}},
+        {"--audio-tracks",
+         "none",
+         "--audio-tracks none leaves the sound out",
+         heading::kSound,
+         {"--audio-codec"},
+         {}},
+    };
+    for (const Omission& omission : kOmissions) {
+        const bool isMeant = std::any_of(given.begin(), given.end(), [&](const CLI::Option* option) {
+            return option->get_name() == omission.option && option->results().back() == omission.value;
+        });
+        for (const CLI::Option* option : given) {
+            const std::string name = option->get_name();
+            const bool hasNoEffect =
+                Holds(omission.further, name) ||
+                (option->get_group() == omission.heading && !Holds(omission.spared, name));
+            if (isMeant && hasNoEffect)
+                Refuse(fmt::format("{}: it excludes {}", omission.claim, name));
+        }
+    }
+}
+
 } // namespace
 
 void CheckTask(const CLI::App& app) {
@@ -58,11 +115,10 @@ void CheckTask(const CLI::App& app) {
         task = asked != nullptr ? asked : task;
     }
     for (const CLI::Option* option : given) {
-        const bool isKnown = task == nullptr || option->get_positional() || FindTask(*option) != nullptr ||
-                             std::count(task->headings.begin(), task->headings.end(), option->get_group());
-        if (!isKnown)
+        if (task != nullptr && !Takes(*task, *option))
             Refuse(fmt::format("{} does not go with {}", option->get_name(), task->option));
     }
+    CheckOmissions(given);
 }
 
 } // namespace movieconv
