@@ -87,6 +87,7 @@ constexpr std::array kPictureRows{
         .deep = true,
         .threads = 1,
         .options = "level=3,g=1,slicecrc=1", // every picture by itself, with a check sum
+        .otherOptions = "level=1,g=1",       // undivided, for pictures with too few columns for the slices
     },
     PictureCodec{
         .code = kMpeg2,

@@ -58,6 +58,7 @@ struct PictureCodec {
     const AVRational* rates = nullptr; ///< All that every player knows, rising, ended by 0; null: any rate.
     bool isBt601 = false; ///< Decoders know but the matrix of BT.601, whatever a container tells.
     double maxRate = 0;   ///< Most pictures a second that players show in time; 0: no limit.
+    const char* otherOptions = nullptr; ///< For pictures that the encoder does not take with `options`.
 };
 
 /// A codec for sound.

@@ -1,5 +1,7 @@
 #include "writer/PictureEncoder.h"
 
+#include "writer/WriterFailure.h"
+
 extern "C" {
 #include <libavutil/imgutils.h>
 #include <libavutil/opt.h>
@@ -72,6 +74,58 @@ void SetQuality(AVCodecContext& context, const QualityScale& scale, double quali
     }
 }
 
+/// With these options of the codec. Throws WriterFailure.
+av::CodecContext OpenWith(const PictureCodec& codec, const PictureSettings& settings, EncoderFlags flags,
+                          const char* options) {
+    av::CodecContext opened = NewEncoder(FindEncoder(codec), codec.code, flags);
+    AVCodecContext& context = *opened;
+    context.width = settings.width;
+    context.height = settings.height;
+    context.pix_fmt = settings.format;
+    // Some codecs limit the terms of the rate to 16 bits.
+    context.framerate = av_d2q(av_q2d(settings.rate), 60000);
+    context.time_base = av_inv_q(context.framerate);
+    context.sample_aspect_ratio = settings.sampleAspect;
+    context.bit_rate = settings.bitrate;
+    if (settings.maxBitrate > 0) {
+        context.rc_max_rate = std::max(settings.maxBitrate, settings.bitrate);
+        context.rc_buffer_size = static_cast<int>(std::min<int64_t>(context.rc_max_rate * 2, INT32_MAX));
+    }
+    context.thread_count = settings.threads;
+    if (settings.inOrder) {
+        context.max_b_frames = 0;
+        if (codec.id == AV_CODEC_ID_MPEG2VIDEO) // whose readers otherwise allow for one picture of reordering
+            context.flags |= AV_CODEC_FLAG_LOW_DELAY;
+    }
+    context.color_range = settings.fullRange ? AVCOL_RANGE_JPEG : AVCOL_RANGE_MPEG;
+    context.color_primaries = settings.primaries;
+    context.color_trc = settings.transfer;
+    context.colorspace = settings.matrix;
+    SetOptions(context, options);
+    if (settings.light && codec.id == AV_CODEC_ID_HEVC) // which also tells it in its own stream
+        SetOption(context, "x265-params", LightParameters(options, *settings.light));
+    SetSpeed(context, codec.speed, settings);
+    if (settings.profile != nullptr)
+        SetOption(context, "profile", settings.profile);
+    if (settings.quality)
+        SetQuality(context, codec.quality, *settings.quality);
+    OpenEncoder(context, codec.code,
+                "pictures of " + std::to_string(settings.width) + "x" + std::to_string(settings.height) +
+                    " at " + std::to_string(av_q2d(settings.rate)) + " a second and " +
+                    std::to_string(settings.bitrate) + " bits a second");
+    return opened;
+}
+
+av::CodecContext OpenAsTaken(const PictureCodec& codec, const PictureSettings& settings, EncoderFlags flags) {
+    try {
+        return OpenWith(codec, settings, flags, codec.options);
+    } catch (const WriterFailure&) {
+        if (codec.otherOptions == nullptr)
+            throw;
+    }
+    return OpenWith(codec, settings, flags, codec.otherOptions);
+}
+
 /// SVT-AV1 is never closed unless it has had a picture: it waits for what it would make of it.
 void EndWithABlackPicture(AVCodecContext& context, AVPacket& packet) noexcept {
     try {
@@ -95,45 +149,9 @@ void EndWithABlackPicture(AVCodecContext& context, AVPacket& packet) noexcept {
 PictureEncoder::PictureEncoder(const PictureCodec& codec, const PictureSettings& settings, EncoderFlags flags,
                                int ticksPerPicture, bool isCut)
     : ticksPerPicture_(ticksPerPicture),
-      context_(NewEncoder(FindEncoder(codec), codec.code, flags)),
+      context_(OpenAsTaken(codec, settings, flags)),
       packet_(av::NewPacket()),
-      holds_(isCut) {
-    AVCodecContext& context = *context_;
-    context.width = settings.width;
-    context.height = settings.height;
-    context.pix_fmt = settings.format;
-    // Some codecs limit the terms of the rate to 16 bits.
-    context.framerate = av_d2q(av_q2d(settings.rate), 60000);
-    context.time_base = av_inv_q(context.framerate);
-    context.sample_aspect_ratio = settings.sampleAspect;
-    context.bit_rate = settings.bitrate;
-    if (settings.maxBitrate > 0) {
-        context.rc_max_rate = std::max(settings.maxBitrate, settings.bitrate);
-        context.rc_buffer_size = static_cast<int>(std::min<int64_t>(context.rc_max_rate * 2, INT32_MAX));
-    }
-    context.thread_count = settings.threads;
-    if (settings.inOrder) {
-        context.max_b_frames = 0;
-        if (codec.id == AV_CODEC_ID_MPEG2VIDEO) // whose readers otherwise allow for one picture of reordering
-            context.flags |= AV_CODEC_FLAG_LOW_DELAY;
-    }
-    context.color_range = settings.fullRange ? AVCOL_RANGE_JPEG : AVCOL_RANGE_MPEG;
-    context.color_primaries = settings.primaries;
-    context.color_trc = settings.transfer;
-    context.colorspace = settings.matrix;
-    SetOptions(context, codec.options);
-    if (settings.light && codec.id == AV_CODEC_ID_HEVC) // which also tells it in its own stream
-        SetOption(context, "x265-params", LightParameters(codec.options, *settings.light));
-    SetSpeed(context, codec.speed, settings);
-    if (settings.profile != nullptr)
-        SetOption(context, "profile", settings.profile);
-    if (settings.quality)
-        SetQuality(context, codec.quality, *settings.quality);
-    OpenEncoder(context, codec.code,
-                "pictures of " + std::to_string(settings.width) + "x" + std::to_string(settings.height) +
-                    " at " + std::to_string(av_q2d(settings.rate)) + " a second and " +
-                    std::to_string(settings.bitrate) + " bits a second");
-}
+      holds_(isCut) {}
 
 PictureEncoder::~PictureEncoder() {
     if (!HasBegun() && context_->codec_id == AV_CODEC_ID_AV1)

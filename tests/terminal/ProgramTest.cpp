@@ -121,12 +121,14 @@ const Args kStill = Join(CountedPictures(14), Beeps(14), Args{"-vf", "select='lt
 const Args kFast = Join(CountedPictures(1, "240"), Args{"-c:v", "libx264"});
 const Args kMilliseconds = Join(CountedPictures(1), Args{"-enc_time_base", "1/1000", "-fps_mode", "vfr"},
                                 Args{"-vf", "settb=1/1000", "-c:v", "mjpeg"});
+const Args kNarrow = Join(CountedPictures(0.2), Args{"-vf", "scale=3:5", "-c:v", "ffv1", "-level", "1"});
 const Args kSmall{"--size",        "80x80", "--frame-rate",     "12.5",
                   "--video-codec", "avc1",  "--video-max-rate", "1M"};
 
 // A part has the picture shown at its begin, and those that begin before its end.
 const Odd kOddities[] = {
     {"size.mkv", Join(CountedPictures(1), Args{"-vf", "scale=161:121", "-c:v", "ffv1"}), "o.mp4", 25, 0},
+    {"narrow.mkv", kNarrow, "o.mkv", 5, 0, {"--video-codec", "FFV1"}},
     {"one.mp4", Join(CountedPictures(0.04), Args{"-c:v", "libx264"}), "o.mp4", 1, 0},
     {"short-sound.mkv", Lossless(3, 1), "o.mp4", 75, 3},
     {"long-sound.mkv", Lossless(1, 3), "o.mp4", 25, 3},
