@@ -219,6 +219,7 @@ void FinishFragments(const std::shared_ptr<ByteFile>& part, const PacketWriter& 
 
 int64_t WholeFragments(ByteFile& part, int64_t size) {
     int64_t whole = 0;
+    bool holdsAny = false;
     int64_t head = -1; // where that of a fragment begins whose data comes next
     for (int64_t position = 0;;) {
         const bool boxFollows = size - position >= int64_t{av::BoxHead::kLeastSize};
@@ -226,12 +227,13 @@ int64_t WholeFragments(ByteFile& part, int64_t size) {
         // Data that is shorter than its box says ends in the midst of another one.
         if (boxFollows && (!box || !IsPartOfFile(*box)))
             return whole;
-        if (head < 0)
+        if (head < 0 && holdsAny)
             whole = position;
         if (!box || box->size > size - position)
             return whole;
         if (head >= 0 && !HoldsAll(part, head, position, *box))
             return whole;
+        holdsAny = holdsAny || head >= 0;
         head = box->type == av::BoxType("moof") ? position : -1;
         position += box->size;
     }

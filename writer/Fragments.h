@@ -21,8 +21,9 @@ void FinishFragments(const std::shared_ptr<ByteFile>& part, const PacketWriter& 
                      const Extras& extras, const std::function<void(double)>& progress);
 
 /// How far `part`, which has `size` bytes, consists of whole fragments, whose data is exactly what their
-/// heads name. The multiplexer does not know: of data that it had no memory for it does not tell, and when it
-/// fails in the midst of a packet, the data of those that follow is not where the head has it.
+/// heads name; 0 where there is none. The multiplexer does not know: of data that it had no memory for it
+/// does not tell, and when it fails in the midst of a packet, the data of those that follow is not where the
+/// head has it.
 int64_t WholeFragments(ByteFile& part, int64_t size);
 
 } // namespace writer

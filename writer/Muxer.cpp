@@ -106,6 +106,7 @@ void Muxer::WriteHeader(int64_t room) {
     Check(avformat_write_header(output_.get(), nullptr), "refuses its header");
     Check(extras_.WriteCover(*output_), "refuses its cover");
     SetLanguageTags();
+    headerEnd_ = avio_tell(output_->pb);
     NoteWhole();
     if (fragmented_)
         SetDelays();
@@ -266,7 +267,8 @@ int64_t Muxer::WholeSize(int64_t size) const {
     if (finished_ && file_.Error() == 0)
         return size;
     const auto beyond = std::upper_bound(wholes_.begin(), wholes_.end(), size);
-    return beyond == wholes_.begin() ? 0 : *std::prev(beyond);
+    const int64_t whole = beyond == wholes_.begin() ? 0 : *std::prev(beyond);
+    return whole > headerEnd_ ? whole : 0;
 }
 
 bool Muxer::Describable() const {

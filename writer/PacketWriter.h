@@ -64,7 +64,7 @@ public:
     virtual int StreamCount() const = 0;
 
     /// How much of the file, of which `size` bytes are on the disk, is whole: what follows is the beginning
-    /// of something (a packet, a cluster, a fragment) whose end never came.
+    /// of something (a packet, a cluster, a fragment) whose end never came. 0 where no packet is.
     virtual int64_t WholeSize(int64_t size) const = 0;
 
     /// Whether the end can be written: there has been a packet of each stream that is described by one.

@@ -236,6 +236,7 @@ TEST_P(FaultIn, EveryWriteIsToldAndLeavesAPlayablePart) {
                       static_cast<int64_t>(std::filesystem::file_size(status.szTemporaryPath)));
             const std::vector<std::string> part = Packets(status.szTemporaryPath);
             EXPECT_TRUE(HoldsWholePackets(part, whole));
+            EXPECT_FALSE(part.empty()) << "nothing of it plays";
             playable += !part.empty() && ReadMovieFile(status.szTemporaryPath).readable ? 1 : 0;
             std::filesystem::remove(status.szTemporaryPath);
         }
