@@ -1,8 +1,10 @@
 #include "writer/FileSystem.h"
 
+#include "platform/LogRoute.h"
 #include "text/FileNames.h"
 #include "text/Path.h"
 #include "text/Utf8.h"
+#include "writer/FileRecord.h"
 
 #include <algorithm>
 #include <array>
@@ -10,6 +12,7 @@
 #include <climits>
 #include <cstdio>
 #include <cstdlib>
+#include <cstring>
 #include <memory>
 #include <new>
 #include <utility>
@@ -115,8 +118,11 @@ public:
         if (errno != EINVAL && errno != ENOSYS)
             return errno;
         // File systems without that operation have hard links; where there are none either, looking must do.
-        if (link(from.c_str(), to.c_str()) == 0)
-            return Remove(from);
+        if (link(from.c_str(), to.c_str()) == 0) {
+            if (const int error = Remove(from); error != 0) // which has its name all the same
+                WriteLog(kLogWarning, "\"%s\" could not be removed: %s.", from.c_str(), std::strerror(error));
+            return 0;
+        }
         if (errno != EPERM && errno != ENOSYS && errno != EOPNOTSUPP)
             return errno;
         return IsMissing(to) ? Rename(from, to, true) : EEXIST;

@@ -12,12 +12,35 @@
 #include <algorithm>
 #include <atomic>
 #include <cerrno>
+#include <cstdio>
 #include <cstring>
+#include <fcntl.h>
 #include <filesystem>
 #include <memory>
 #include <string>
+#include <sys/syscall.h>
+#include <unistd.h>
 #include <utility>
 #include <vector>
+
+namespace {
+
+/// What a file system refuses: that of the tests has it all.
+int g_exclusiveRenameError = 0;
+int g_unlinkError = 0;
+
+} // namespace
+
+extern "C" int renameat2(int /*fromFolder*/, const char* from, int /*toFolder*/, const char* to,
+                         unsigned flags) noexcept {
+    errno = g_exclusiveRenameError;
+    return errno != 0 ? -1 : static_cast<int>(syscall(SYS_renameat2, AT_FDCWD, from, AT_FDCWD, to, flags));
+}
+
+extern "C" int unlink(const char* path) noexcept {
+    errno = g_unlinkError;
+    return errno != 0 ? -1 : static_cast<int>(syscall(SYS_unlinkat, AT_FDCWD, path, 0));
+}
 
 namespace {
 
@@ -292,6 +315,19 @@ TEST_F(Fault, SyncAndRenameKeepTheDataUnderItsTemporaryName) {
         EXPECT_EQ(folder_.Names().size(), 1U);
         std::filesystem::remove(status.szTemporaryPath);
     }
+}
+
+// Where a file gets its name without replacing another only as a second one.
+TEST(PosixFiles, ThatHaveTheirNameAreDoneThoughTheFirstOneStays) {
+    const Folder folder;
+    WriteFile(folder / "movie.part", "movie");
+    g_exclusiveRenameError = EINVAL;
+    g_unlinkError = EACCES;
+    const int error = writer::SystemFiles().Rename(folder / "movie.part", folder / "movie", false);
+    g_exclusiveRenameError = g_unlinkError = 0;
+    EXPECT_EQ(error, 0) << std::strerror(error);
+    EXPECT_EQ(ReadFile(folder / "movie"), "movie");
+    EXPECT_EQ(writer::SystemFiles().Rename(folder / "movie.part", folder / "movie", false), EEXIST);
 }
 
 // Without it the fragmented file is a whole movie, unless something is in the index alone.
