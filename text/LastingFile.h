@@ -15,6 +15,13 @@ namespace text {
 bool ReplaceLastingly(const std::string& path, const std::string& making, std::string_view bytes,
                       mode_t mode);
 
+/// Likewise, but with errno EEXIST where the name is taken.
+bool AddLastingly(const std::string& path, const std::string& making, std::string_view bytes, mode_t mode);
+
+/// Gives a file another name, in one step where the file system can; EEXIST where that is taken. 0 or an
+/// errno value. Allocates nothing.
+int RenameToMissing(const std::string& from, const std::string& to);
+
 /// Gives a synced file its name. False, with errno set, when that fails.
 bool RenameLastingly(const std::string& from, const std::string& to);
 

@@ -1,10 +1,9 @@
 #include "writer/FileSystem.h"
 
-#include "platform/LogRoute.h"
 #include "text/FileNames.h"
+#include "text/LastingFile.h"
 #include "text/Path.h"
 #include "text/Utf8.h"
-#include "writer/FileRecord.h"
 
 #include <algorithm>
 #include <array>
@@ -12,7 +11,6 @@
 #include <climits>
 #include <cstdio>
 #include <cstdlib>
-#include <cstring>
 #include <memory>
 #include <new>
 #include <utility>
@@ -113,19 +111,7 @@ public:
     int Rename(const std::string& from, const std::string& to, bool replace) override {
         if (replace)
             return rename(from.c_str(), to.c_str()) == 0 ? 0 : errno;
-        if (renameat2(AT_FDCWD, from.c_str(), AT_FDCWD, to.c_str(), RENAME_NOREPLACE) == 0)
-            return 0;
-        if (errno != EINVAL && errno != ENOSYS)
-            return errno;
-        // File systems without that operation have hard links; where there are none either, looking must do.
-        if (link(from.c_str(), to.c_str()) == 0) {
-            if (const int error = Remove(from); error != 0) // which has its name all the same
-                WriteLog(kLogWarning, "\"%s\" could not be removed: %s.", from.c_str(), std::strerror(error));
-            return 0;
-        }
-        if (errno != EPERM && errno != ENOSYS && errno != EOPNOTSUPP)
-            return errno;
-        return IsMissing(to) ? Rename(from, to, true) : EEXIST;
+        return text::RenameToMissing(from, to);
     }
 
     int Remove(const std::string& path) override { return unlink(path.c_str()) == 0 ? 0 : errno; }

@@ -170,8 +170,9 @@ std::optional<Plan> Foreman::Prepare() {
     if (left.plan)
         return left.plan;
     std::optional<Plan> plan = MakePlan(std::move(begun), [this] { return Stopped(); });
-    if (plan)
-        WritePlan(order_.planPath, *plan);
+    if (plan && !WritePlan(order_.planPath, *plan, false))
+        throw Failure(Category::kOutput,
+                      fmt::format("another run has made \"{}\" meanwhile", order_.planPath));
     return plan;
 }
 

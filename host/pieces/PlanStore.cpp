@@ -12,6 +12,7 @@
 #include <filesystem>
 #include <fmt/format.h>
 #include <system_error>
+#include <unistd.h>
 
 namespace movieconv {
 
@@ -54,6 +55,8 @@ PlanStore::Leftover PlanStore::Take(const Plan& now, const Request& request, IfT
     if (planned)
         RequireLeave(now, pieces, ifThere == IfThere::kReplace);
     RemovePieces(path_, request);
+    if (planned)
+        unlink(path_.c_str());
     if (resume || (!planned && pieces == 0))
         return {};
     return {std::nullopt,

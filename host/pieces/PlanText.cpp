@@ -146,11 +146,15 @@ Plan ReadPlan(const std::string& path) {
     }
 }
 
-void WritePlan(const std::string& path, Plan& plan) {
+bool WritePlan(const std::string& path, Plan& plan, bool replace) {
     Json json = AsJson(plan);
     plan.hash = HashOf(json);
     json["hash"] = plan.hash;
-    WriteWhole(path, json.dump(kIndent) + "\n");
+    const std::string text = json.dump(kIndent) + "\n";
+    if (!replace)
+        return WriteNew(path, text);
+    WriteWhole(path, text);
+    return true;
 }
 
 bool IsPlanInTheMaking(const std::filesystem::path& file, const std::string& path) {

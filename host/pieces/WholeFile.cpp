@@ -59,6 +59,14 @@ void WriteWhole(const std::string& path, std::string_view text) {
         throw CannotWrite(path);
 }
 
+bool WriteNew(const std::string& path, std::string_view text) {
+    if (text::AddLastingly(path, NameInTheMaking(path), text, 0666))
+        return true;
+    if (errno == EEXIST)
+        return false;
+    throw CannotWrite(path);
+}
+
 void AppendWhole(const std::string& path, std::string_view text) {
     text::Descriptor file(
         open(path.c_str(), O_WRONLY | O_CREAT | O_APPEND | O_NOFOLLOW | O_NONBLOCK | O_CLOEXEC, 0666));

@@ -16,6 +16,9 @@ std::string ReadWhole(const std::string& path, int64_t most);
 /// Writes it beside and gives it the name, synced; what stood there is replaced. Throws Failure.
 void WriteWhole(const std::string& path, std::string_view text);
 
+/// Likewise, unless something stands there: then it stays, and the answer is false.
+bool WriteNew(const std::string& path, std::string_view text);
+
 /// Writes behind what a file holds, and to the disk; makes it when there is none. Throws Failure,
 /// also for a symbolic link and what is no file.
 void AppendWhole(const std::string& path, std::string_view text);

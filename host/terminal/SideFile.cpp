@@ -2,6 +2,7 @@
 
 #include "host/convert/Failure.h"
 #include "text/Descriptor.h"
+#include "text/LastingFile.h"
 
 #include <cerrno>
 #include <cstdio>
@@ -22,18 +23,11 @@ std::optional<FileId> IdOf(const std::string& path) {
 }
 
 /// For file systems that know no conditional renaming: looking must do.
-int RenameExpected(const std::string& temporary, const std::string& path,
-                   const std::optional<FileId>& expected) {
+int RenameExpected(const std::string& temporary, const std::string& path, const FileId& expected) {
     const std::optional<FileId> found = IdOf(path);
     if (found && found != expected)
         return EEXIST;
     return std::rename(temporary.c_str(), path.c_str()) == 0 ? 0 : errno;
-}
-
-int RenameToMissing(const std::string& temporary, const std::string& path) {
-    if (renameat2(AT_FDCWD, temporary.c_str(), AT_FDCWD, path.c_str(), RENAME_NOREPLACE) == 0)
-        return 0;
-    return errno == EINVAL || errno == ENOSYS ? RenameExpected(temporary, path, std::nullopt) : errno;
 }
 
 int Exchange(const std::string& a, const std::string& b) {
@@ -95,12 +89,12 @@ void RequireWritable(const SideFile& file, const char* option, const std::string
 int ReplaceExpected(const std::string& temporary, const std::string& path,
                     const std::optional<FileId>& expected) {
     if (!expected)
-        return RenameToMissing(temporary, path);
+        return text::RenameToMissing(temporary, path);
     const int error = Exchange(temporary, path);
     if (error == ENOENT)
-        return RenameToMissing(temporary, path);
+        return text::RenameToMissing(temporary, path);
     if (error == EINVAL || error == ENOSYS)
-        return RenameExpected(temporary, path, expected);
+        return RenameExpected(temporary, path, *expected);
     if (error != 0)
         return error;
     if (IdOf(temporary) == expected)

@@ -75,29 +75,36 @@ std::optional<Plan> PlanThere(const std::string& path, const Plan& begun) {
     return there;
 }
 
+/// Another one can be made at the same time: so it is looked for again where the name is taken by then.
+Plan MakeOrFindPlan(const Request& request, const Division& division, const std::string& path) {
+    const Plan begun = BeginPlan(request, division);
+    for (;;) {
+        if (const std::optional<Plan> there = request.overwrite ? std::nullopt : PlanThere(path, begun))
+            return *there;
+        std::optional<Plan> made = MakePlan(begun, [] { return false; });
+        if (WritePlan(path, *made, request.overwrite))
+            return *made;
+    }
+}
+
 ExitCode WriteNewPlan(const Options& options, const StandardStreams& streams) {
     const std::string& path = *options.plan;
     if (options.request.input == kStandardInput)
         throw Failure(Category::kRequest, "whoever makes the pieces cannot read this standard input");
     CheckOutput(options.request); // before all is made that cannot be joined
-    Plan begun = BeginPlan(options.request, options.division);
-    std::optional<Plan> plan = options.request.overwrite ? std::nullopt : PlanThere(path, begun);
-    if (!plan) {
-        plan = MakePlan(std::move(begun), [] { return false; });
-        WritePlan(path, *plan);
-    }
+    const Plan plan = MakeOrFindPlan(options.request, options.division, path);
     if (options.quiet)
         return ExitCode::kDone;
     for (const std::string& complaint : options.complaints)
         streams.PrintError(fmt::format("movieconv: warning: {}", complaint));
-    if (const std::string cost = TellBitRate(*plan); !cost.empty())
+    if (const std::string cost = TellBitRate(plan); !cost.empty())
         streams.PrintError(fmt::format("movieconv: warning: {}", cost));
     PrintWhole(streams,
                options.progress == ProgressStyle::kJson
-                   ? PlanAsJson(path, plan->Pieces())
+                   ? PlanAsJson(path, plan.Pieces())
                    : fmt::format("{}: pieces 0 to {}, the last one is the sound and whatever else is "
                                  "carried\n",
-                                 text::Printable(path), plan->Pieces() - 1));
+                                 text::Printable(path), plan.Pieces() - 1));
     return ExitCode::kDone;
 }
 

@@ -1,6 +1,7 @@
 // What a plan is made of: the source as it was when planning began.
 #include "host/pieces/Planner.h"
 #include "host/convert/Failure.h"
+#include "host/pieces/PlanText.h"
 #include "tests/support/Folder.h"
 #include "tests/support/TestMovies.h"
 
@@ -9,6 +10,7 @@
 #include <fstream>
 #include <optional>
 #include <string>
+#include <vector>
 
 namespace {
 
@@ -45,6 +47,22 @@ TEST(Planning, EndsWhereTheSourceEndedWhenItBeganAndTellsThatItGrew) {
     ASSERT_TRUE(failure);
     EXPECT_EQ(failure->Kind(), Category::kSource);
     EXPECT_NE(failure->Text().find("was written to while it was read"), std::string::npos) << failure->Text();
+}
+
+// As two processes do that found none.
+TEST(Planning, LeavesAPlanThatCameInBetween) {
+    const Folder folder;
+    const std::string path = folder / "movie.plan";
+    movieconv::Plan first;
+    movieconv::Plan second;
+    first.output = "first.mp4";
+    second.output = "second.mp4";
+    EXPECT_TRUE(movieconv::WritePlan(path, first, false));
+    EXPECT_FALSE(movieconv::WritePlan(path, second, false));
+    EXPECT_NE(ReadFile(path).find("first.mp4"), std::string::npos);
+    EXPECT_TRUE(movieconv::WritePlan(path, second, true));
+    EXPECT_NE(ReadFile(path).find("second.mp4"), std::string::npos);
+    EXPECT_EQ(folder.Names(), std::vector<std::string>{"movie.plan"});
 }
 
 } // namespace
