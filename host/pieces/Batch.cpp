@@ -3,7 +3,6 @@
 #include "host/convert/EncodePlan.h"
 #include "host/convert/Failure.h"
 #include "host/convert/Sources.h"
-#include "host/pieces/FileLock.h"
 #include "host/pieces/MarkText.h"
 #include "host/pieces/MovieErrand.h"
 #include "host/pieces/OutputNames.h"
@@ -127,6 +126,12 @@ Verdict Batch::Perform() {
     if (error)
         throw Failure(Category::kOutput,
                       fmt::format("the folder \"{}\" cannot be made: {}", order_.folder, error.message()));
+    lock_.emplace(order_.folder); // the journal tells what others did before, not what they do
+    if (lock_->Result() == FileLock::State::kElsewhere)
+        throw Failure(
+            Category::kOutput,
+            fmt::format("another run is working on \"{}\"; wait until it ends, or choose another folder",
+                        order_.folder));
     journal_.emplace(order_.folder);
     List();
     count_ = static_cast<int>(waiting_.size());

@@ -4,6 +4,7 @@
 
 #include "host/pieces/BatchJournal.h"
 #include "host/pieces/Crew.h"
+#include "host/pieces/FileLock.h"
 
 #include <atomic>
 #include <deque>
@@ -60,6 +61,7 @@ private:
     Verdict Conclude();
 
     const BatchOrder order_;
+    std::optional<FileLock> lock_; // the folder's
     std::optional<BatchJournal> journal_;
     std::string settings_;
     std::atomic<int> opened_{0}; // files

@@ -9,8 +9,8 @@
 
 namespace movieconv {
 
-/// Holds a file that is there, if nobody else does, for as long as the object exists. A process that is
-/// killed holds nothing any more.
+/// Holds a file or folder that is there, if nobody else does, for as long as the object exists. A process
+/// that is killed holds nothing any more.
 class FileLock {
 public:
     enum class State {

@@ -44,16 +44,19 @@ PlanStore::Leftover PlanStore::Take(const Plan& now, const Request& request, IfT
     const bool planned = exists(std::filesystem::symlink_status(path_, unknown));
     const int pieces = CountPieces(path_);
     const bool resume = ifThere == IfThere::kResume;
-    if (planned && resume) {
-        Plan before = ReadPlan(path_);
-        if (const std::string difference = Difference(before, now); !difference.empty())
-            throw Failure(Category::kRequest,
-                          fmt::format("\"{}\" is of another conversion: {}", path_, difference),
-                          Reason::kCannotResume);
+    const std::optional<Plan> before = planned ? std::optional(Own()) : std::nullopt;
+    const std::string difference = before ? Difference(*before, now) : std::string();
+    if (before && resume && !difference.empty())
+        throw Failure(Category::kRequest,
+                      fmt::format("\"{}\" is of another conversion: {}", path_, difference),
+                      Reason::kCannotResume);
+    if (before && resume)
         return {before};
-    }
-    if (planned)
-        RequireLeave(now, pieces, ifThere == IfThere::kReplace);
+    if (before && pieces > 0 && ifThere == IfThere::kRefuse && difference.empty())
+        throw Failure(Category::kOutput,
+                      fmt::format("{} of {} pieces are left of an earlier run beside \"{}\"", pieces,
+                                  before->Pieces(), path_),
+                      Reason::kLeftover);
     RemovePieces(path_, request);
     if (planned)
         unlink(path_.c_str());
@@ -63,24 +66,17 @@ PlanStore::Leftover PlanStore::Take(const Plan& now, const Request& request, IfT
             fmt::format("\"{}\" with {} pieces was left of an earlier run; it is made anew", path_, pieces)};
 }
 
-/// Throws Failure when the plan that is there is something else, which must not be lost, or pieces of this
-/// very conversion would be. Nobody has named it, so leave to replace the output is none to replace another
-/// file.
-void PlanStore::RequireLeave(const Plan& now, int pieces, bool replace) const {
-    std::optional<Plan> before;
+/// The plan that is there. Throws Failure when that is something else, which must not be lost: nobody has
+/// named it, so leave to replace the output is none to replace another file.
+Plan PlanStore::Own() const {
     try {
-        before = ReadPlan(path_);
+        return ReadPlan(path_);
     } catch (const Failure& failure) {
         throw Failure(Category::kOutput,
                       fmt::format("the plan would replace another file: {}; give the output another name, or "
                                   "remove that file",
                                   failure.Text()));
     }
-    if (pieces > 0 && !replace && Difference(*before, now).empty())
-        throw Failure(Category::kOutput,
-                      fmt::format("{} of {} pieces are left of an earlier run beside \"{}\"", pieces,
-                                  before->Pieces(), path_),
-                      Reason::kLeftover);
 }
 
 } // namespace movieconv

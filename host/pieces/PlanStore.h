@@ -37,7 +37,7 @@ public:
     Leftover Take(const Plan& now, const Request& request, IfThere ifThere) const;
 
 private:
-    void RequireLeave(const Plan& now, int pieces, bool replace) const;
+    Plan Own() const;
 
     const std::string path_;
 };

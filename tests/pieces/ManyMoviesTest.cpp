@@ -1,4 +1,5 @@
 // The program with --into: many movies, what is done already left as it is.
+#include "tests/pieces/ExitCodes.h"
 #include "tests/support/Folder.h"
 #include "tests/support/Program.h"
 #include "tests/support/TestMovies.h"
@@ -315,10 +316,10 @@ TEST(ManyMovies, LeaveNothingUnfinishedAfterKills) {
     EXPECT_EQ(folder.Names("out"), (std::vector<std::string>{"long.mp4.part", "movieconv.journal"}));
     Running first(convert, false);
     ASSERT_TRUE(first.WaitFor(R"("event":"clip_opened")"));
-    first.Signal(SIGSTOP);
-    kill();
+    const Result second = Call(convert);
+    EXPECT_EQ(second.code, kCannotWrite);
+    EXPECT_TRUE(Has(second.err, "another run is working on")) << second.err;
     EXPECT_TRUE(std::filesystem::exists(out + "/long.mp4.part")) << "which the first one is writing";
-    first.Signal(SIGCONT);
     const Result result = first.Finish();
     EXPECT_EQ(result.code, 0) << result.out << result.err;
 }
