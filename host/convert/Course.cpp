@@ -341,6 +341,8 @@ void Course::ReportComplaints() {
     EncodeParam param{};
     MCGetEncodeParam(engine_.get(), &param);
     std::vector<std::string> complaints = TellSoundLoss(movie_.Info(), request_, param);
+    if (std::string loss = TellRateLoss(request_, movie_.Info()); !loss.empty())
+        complaints.push_back(std::move(loss));
     for (std::string& complaint : movie_.Complaints())
         complaints.push_back(std::move(complaint));
     for (const std::string& complaint : complaints)

@@ -113,6 +113,16 @@ EncodeParam PlanEncoding(const EncodeParam& defaults, const FileFormatInfo& form
     return param;
 }
 
+std::string TellRateLoss(const Request& request, const SourceInfo& source) {
+    const FileFormatInfo& format = ChooseFormat(request);
+    if (!source.pictures || format.bHasVideo == 0 || !Has(format, kWriterFormatSteadyRate) ||
+        source.pictures->frameRate <= kHighestFrameRate ||
+        PlanPictures(request, format, *source.pictures).frameRate)
+        return {};
+    return fmt::format("its {:.0f} pictures a second got {:.0f}", source.pictures->frameRate,
+                       kHighestFrameRate);
+}
+
 double LengthToConvert(const Request& request, const SourceInfo& source) {
     const double rest = source.duration - request.begin;
     if (rest <= 0 && source.certainty == Certainty::kKnown) {

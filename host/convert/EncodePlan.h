@@ -6,6 +6,8 @@
 #include "host/source/Source.h"
 #include "media/EncodeParam.h"
 
+#include <string>
+
 namespace movieconv {
 
 /// The file format to write. Throws Failure when there is none.
@@ -14,6 +16,10 @@ const FileFormatInfo& ChooseFormat(const Request& request);
 /// `defaults` changed as the request says, for a file of `format`. Throws Failure.
 EncodeParam PlanEncoding(const EncodeParam& defaults, const FileFormatInfo& format, const Request& request,
                          const SourceInfo& source);
+
+/// What becomes of a source with more pictures a second than the engine gives a format that needs a steady
+/// rate, a sentence; empty where every picture has its own time, or another rate was asked for.
+std::string TellRateLoss(const Request& request, const SourceInfo& source);
 
 /// Seconds of the source that the request asks for. Throws Failure when they begin behind its end.
 double LengthToConvert(const Request& request, const SourceInfo& source);

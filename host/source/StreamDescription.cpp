@@ -75,15 +75,16 @@ bool IsUsual(AVRational rate) {
     return rate.num > 0 && rate.den > 0 && av_q2d(rate) <= kUsualFrameRate;
 }
 
-/// Pictures per second by the container's word: the average rate, or its nominal one where they agree. 0 when
-/// neither is usual.
+/// Pictures per second by the container's word: the average rate, or its nominal one where they agree or no
+/// average is told. 0 when that is not usual.
 double ToldFrameRate(const AVStream* stream) {
     const AVRational average = stream->avg_frame_rate;
     const AVRational nominal = stream->r_frame_rate;
     if (IsUsual(average))
         return av_q2d(IsUsual(nominal) && std::abs(av_q2d(nominal) / av_q2d(average) - 1) < 0.01 ? nominal
                                                                                                  : average);
-    return IsUsual(nominal) ? av_q2d(nominal) : 0;
+    const bool isAverageTold = average.num > 0 && average.den > 0;
+    return IsUsual(nominal) && !isAverageTold ? av_q2d(nominal) : 0;
 }
 
 /// Reads the turn that brings the stored picture upright from the container's display matrix.

@@ -158,6 +158,20 @@ TEST(Program, WritesTransportStreamsOfBothKinds) {
     }
 }
 
+// The engine tells an encoder no higher rate than 200, which an AVI cannot exceed then.
+TEST(Program, TellsTheRateOfFastMoviesAndWhatBecomesOfIt) {
+    const std::string source = Make("faster.mkv", Join(CountedPictures(0.5, "500"), Args{"-c:v", "mpeg4"}));
+    const Folder folder;
+    for (const auto& [name, rate, told] : {std::tuple{"o.mp4", 500.0, false}, {"o.avi", 200.0, true}}) {
+        const Result result = Call({source, folder / name});
+        EXPECT_EQ(result.code, 0) << result.err;
+        EXPECT_EQ(result.err.find("its 500 pictures a second got 200") != std::string::npos, told)
+            << result.err;
+        EXPECT_NEAR(movieconv::Movie(folder / name, {}).Info().pictures->frameRate, rate, 0.02 * rate)
+            << name;
+    }
+}
+
 TEST(Program, TakesNamesInAnyScript) {
     const Folder folder;
     const std::string dashed = folder / "-y";

@@ -177,6 +177,7 @@ constexpr const char* kSentences[] = {
     QT_TRANSLATE_NOOP("Library", "interlaced pictures stayed as they are, in files that do not tell it"),
     QT_TRANSLATE_NOOP("Library", "its pictures of %1 bits got 8"),
     QT_TRANSLATE_NOOP("Library", "its pictures of %1 bits got 10"),
+    QT_TRANSLATE_NOOP("Library", "its %1 pictures a second got %2"),
     QT_TRANSLATE_NOOP("Library", "its %1 sound became %2"),
     QT_TRANSLATE_NOOP("Library", "its sound of %1 Hz got %2"),
     QT_TRANSLATE_NOOP("Library", "its sound of %1 channels got %2"),

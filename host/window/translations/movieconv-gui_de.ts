@@ -954,6 +954,10 @@
         <translation>die Bilder mit %1 Bit bekamen 10</translation>
     </message>
     <message>
+        <source>its %1 pictures a second got %2</source>
+        <translation>aus %1 Bildern je Sekunde wurden %2</translation>
+    </message>
+    <message>
         <source>its %1 sound became %2</source>
         <translation>der Ton in %1 wurde %2</translation>
     </message>
