@@ -83,6 +83,10 @@ protected:
     void Finish();
 
     bool Stopped() const { return stop_; }
+
+    /// Has what is under way, and the clock, heed a pause or its end.
+    void FollowWishes();
+    bool Paused() const { return paused_; }
     Outlet& News() { return outlet_; }
     double Worked() const { return clock_.Seconds(); }
     /// Unless there is a pause or what is done stands still.
@@ -101,7 +105,6 @@ private:
     class Hand;
 
     void Run() noexcept;
-    void FollowWishes();
     bool AllWaitForRoom() const;
     void TakeEnded();
 

@@ -284,30 +284,34 @@ void Foreman::Report() {
     Tell(report);
 }
 
-/// Tells how far the joining is; false to end it.
-bool Foreman::FollowJoining(const Joining& latest) {
+/// Tells how far the joining is.
+Going Foreman::FollowJoining(const Joining& latest) {
     constexpr std::chrono::milliseconds kShortest{100}; // between two reports
+    FollowWishes();
     const bool waits = latest.waitsFor > 0;
     const bool waited = joining_ && joining_->waitsFor > 0;
     if (joining_) // before the first report comes work without waits
         TickAfterWait();
     TickClock(waits);
     if (Stopped())
-        return false;
-    if (joining_ && waits == waited && WorkClock::Now() - toldAt_ < kShortest)
-        return true;
+        return Going::kEnds;
+    const Going going = Paused() ? Going::kPaused : Going::kOn;
+    const Phase phase = Paused() ? Phase::kPaused : waits ? Phase::kWaitingForRoom : Phase::kFinishing;
+    if (joining_ && phase == joiningPhase_ && WorkClock::Now() - toldAt_ < kShortest)
+        return going;
     if (waits && !waited)
         News().Warned(WaitsForRoom(plan_.output, latest.waitsFor));
     joining_ = latest;
+    joiningPhase_ = phase;
     toldAt_ = WorkClock::Now();
     Progress report;
-    report.phase = waits ? Phase::kWaitingForRoom : Phase::kFinishing;
+    report.phase = phase;
     report.finished = latest.share;
     report.position = done_;
     report.bytes = bytes_;
     report.length = length_;
     Tell(report);
-    return true;
+    return going;
 }
 
 void Foreman::JoinAll() {

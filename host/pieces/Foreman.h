@@ -50,7 +50,7 @@ private:
     std::set<int> TakeLacking();
     void Announce();
     int JobsFor();
-    bool FollowJoining(const Joining& latest);
+    Going FollowJoining(const Joining& latest);
     void JoinAll();
     void TellWhatStays();
 
@@ -68,6 +68,7 @@ private:
     std::set<int> fromStart_;        // of these, those for which the source is read from its start
     std::string leftover_;           // what there is to tell of an earlier run
     std::optional<Joining> joining_; // as it was told last
+    Phase joiningPhase_ = Phase::kFinishing;
     WorkClock::Time toldAt_;
     Verdict verdict_;
     double length_ = 0;  // seconds of all pictures to be converted

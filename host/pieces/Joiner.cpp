@@ -21,8 +21,11 @@
 #include "text/Utf8.h"
 
 #include <atomic>
+#include <condition_variable>
 #include <fmt/format.h>
 #include <future>
+#include <mutex>
+#include <optional>
 #include <utility>
 #include <vector>
 
@@ -31,13 +34,19 @@ namespace {
 
 constexpr double kCheckingShare = 0.3; // of the time that all of it takes
 
-void CheckPieces(const Plan& plan, const std::string& planPath,
-                 const std::function<bool(const Joining&)>& goesOn) {
+/// `bell` ends a pause.
+void CheckPieces(const Plan& plan, const std::string& planPath, Bell& bell,
+                 const std::function<Going(const Joining&)>& follow) {
     constexpr std::size_t kMostTold = 5;
     std::string faults;
     std::size_t count = 0;
-    for (int number = 0; number < plan.Pieces() && goesOn({kCheckingShare * number / plan.Pieces(), 0});
-         ++number) {
+    for (int number = 0; number < plan.Pieces(); ++number) {
+        const Joining latest{kCheckingShare * number / plan.Pieces(), 0};
+        Going going = follow(latest);
+        for (; going == Going::kPaused; going = follow(latest))
+            bell.Wait(std::nullopt);
+        if (going == Going::kEnds)
+            break;
         const std::string fault = FaultOf(plan, planPath, number);
         if (!fault.empty() && ++count <= kMostTold)
             faults += (faults.empty() ? "" : "; ") + fault;
@@ -57,9 +66,9 @@ Request JoinRequest(const Plan& plan, const JoinOrder& order) {
     return request;
 }
 
-/// Has the media writer join them. `follow` is asked with the share that is done whether to go on.
+/// Has the media writer join them. `goesOn` is asked with the share that is done whether to go on.
 void Join(const Plan& plan, const std::string& planPath, const Request& request, Movie& movie,
-          const Engine& engine, std::function<bool(double)> follow) {
+          const Engine& engine, std::function<bool(double)> goesOn) {
     std::vector<std::string> paths;
     for (int number = 0; number < plan.Pieces(); ++number)
         paths.push_back(PiecePath(planPath, number));
@@ -70,7 +79,7 @@ void Join(const Plan& plan, const std::string& planPath, const Request& request,
     join.nPieces = plan.Pieces();
     join.pszPieces = names.data();
     join.llSourceBegin = plan.pictures.front().begin;
-    join.pContext = &follow;
+    join.pContext = &goesOn;
     join.pfnGoesOn = [](void* context, double share) {
         return (*static_cast<std::function<bool(double)>*>(context))(share) ? 1 : 0;
     };
@@ -97,6 +106,8 @@ public:
             const Finally ring(*this);
             join([this](double share) {
                 share_ = share;
+                std::unique_lock lock(mutex_);
+                changed_.wait(lock, [this] { return !paused_ || ends_; });
                 return !ends_;
             });
         });
@@ -105,8 +116,20 @@ public:
     bool HasEnded() const { return ended_; }
     double Share() const { return share_; }
 
+    void SetPaused(bool paused) {
+        {
+            const std::lock_guard lock(mutex_);
+            paused_ = paused;
+        }
+        changed_.notify_one();
+    }
+
     void End() {
-        ends_ = true;
+        {
+            const std::lock_guard lock(mutex_);
+            ends_ = true;
+        }
+        changed_.notify_one();
         watch_.GiveUp();
     }
 
@@ -131,8 +154,11 @@ private:
     WriterWatch& watch_;
     Bell& bell_;
     std::atomic<double> share_{0};
-    std::atomic<bool> ends_{false};
     std::atomic<bool> ended_{false};
+    std::mutex mutex_; // guards the wishes
+    std::condition_variable changed_;
+    bool paused_ = false;
+    bool ends_ = false;
     std::future<void> work_; // last: it waits for the end
 };
 
@@ -156,10 +182,10 @@ Verdict VerdictOn(const Plan& plan, const Request& request, const FileLedger& fi
 } // namespace
 
 Verdict JoinPieces(const Plan& plan, const std::string& planPath, const JoinOrder& order, Observer& observer,
-                   Bell& bell, const std::function<bool(const Joining&)>& goesOn) {
+                   Bell& bell, const std::function<Going(const Joining&)>& follow) {
     const Request request = JoinRequest(plan, order);
     CheckOutput(request);
-    CheckPieces(plan, planPath, goesOn);
+    CheckPieces(plan, planPath, bell, follow);
     Request reading = request;
     reading.piece.emplace().pictures = false;
     Movie movie = OpenMovie(reading);
@@ -176,14 +202,21 @@ Verdict JoinPieces(const Plan& plan, const std::string& planPath, const JoinOrde
             files.Enter(*news);
     };
     JoiningThread joining(watch, bell);
-    joining.Start([&](std::function<bool(double)> follow) {
-        Join(plan, planPath, request, movie, engine, std::move(follow));
+    const auto heed = [&] {
+        const Going going =
+            follow({kCheckingShare + joining.Share() * (1 - kCheckingShare), watch.WaitsForRoom()});
+        joining.SetPaused(going == Going::kPaused);
+        if (going == Going::kEnds)
+            joining.End();
+    };
+    heed(); // a pause may have begun before
+    joining.Start([&](std::function<bool(double)> goesOn) {
+        Join(plan, planPath, request, movie, engine, std::move(goesOn));
     });
     while (!joining.HasEnded()) {
         enterNews();
-        if (!goesOn({kCheckingShare + joining.Share() * (1 - kCheckingShare), watch.WaitsForRoom()}))
-            joining.End();
         bell.Wait(WorkClock::kTick);
+        heed();
     }
     joining.Wait();
     enterNews();

@@ -1,4 +1,6 @@
 // The program's plans, pieces and joins, as a farm and as people use them.
+#include "host/pieces/Joiner.h"
+#include "host/pieces/PlanText.h"
 #include "tests/pieces/ExitCodes.h"
 #include "tests/pieces/Packets.h"
 #include "tests/support/Folder.h"
@@ -340,6 +342,32 @@ TEST(Pieces, ResumeOnlyTheSameConversionAndTellWhatDiffers) {
     EXPECT_EQ(anew.code, 0);
     EXPECT_TRUE(Has(anew.err, "with 5 pieces was left of an earlier run")) << anew.err;
     EXPECT_FALSE(std::filesystem::exists(plan));
+}
+
+TEST(Pieces, AreNeitherCheckedNorJoinedDuringAPause) {
+    struct : movieconv::Observer {
+        void Ended(const movieconv::Verdict& /*news*/) override {}
+    } nobody;
+    constexpr int kQuestions = 4;
+    constexpr double kChecked = 0.3;
+    const Planned farm;
+    farm.MakeAll();
+    movieconv::Bell bell;
+    int checking = 0;
+    int joining = 0;
+    const auto pause = [&](const movieconv::Joining& latest) {
+        if (latest.share == 0)
+            bell.Ring(); // as what ends a pause does
+        const bool isPaused = latest.share == 0          ? ++checking <= kQuestions
+                              : latest.share >= kChecked ? ++joining <= kQuestions
+                                                         : false;
+        return isPaused ? movieconv::Going::kPaused : movieconv::Going::kOn;
+    };
+    const movieconv::Verdict verdict =
+        movieconv::JoinPieces(movieconv::ReadPlan(farm.plan), farm.plan, {}, nobody, bell, pause);
+    EXPECT_EQ(verdict.outcome, movieconv::Outcome::kDone);
+    EXPECT_GT(checking, kQuestions);
+    EXPECT_GT(joining, kQuestions) << "it did not wait";
 }
 
 TEST(Pieces, CostNothingWhereThereIsOne) {
