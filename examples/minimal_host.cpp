@@ -86,7 +86,8 @@ int main(int argc, char** argv) {
     Pictures pictures;
     Sound sound;
     EncodeParam param;
-    MCResult result = {sizeof result};
+    MCResult result{};
+    result.nSize = sizeof result;
     MCSetLogCallback([](void*, int, const char*) {}, nullptr); // or a log of one's own
     MCHandle converter = MCCreate(&pictures, &sound);
     if (!converter || !MCEncodeParamForFile(wide.c_str(), &param))
