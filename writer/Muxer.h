@@ -108,9 +108,9 @@ private:
     mutable std::mutex mutex_;
     mutable std::condition_variable changed_;
     std::vector<State> streams_;
-    bool ended_ = false;          ///< The end was asked for,
-    bool finished_ = false;       ///< and is written.
-    int64_t bytesAtFirst_ = 0;    ///< Of the packets that came before each stream had begun.
+    bool ended_ = false;       ///< The end was asked for,
+    bool finished_ = false;    ///< and is written.
+    int64_t bytesAtFirst_ = 0; ///< Of the packets that came before each stream had begun.
     int64_t headerEnd_ = 0;
     std::deque<int64_t> wholes_;  ///< Sizes at which the file was whole; the first is on the disk.
     int64_t flushed_ = INT64_MIN; ///< Time of the packet after which was flushed, in microseconds.

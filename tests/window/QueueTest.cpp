@@ -86,6 +86,21 @@ TEST(Queue, FollowsEditsAndNamingUntilTheUserNamesTheTarget) {
     EXPECT_EQ(bench.At(1).findings.warnings.size(), 1);
 }
 
+TEST(Queue, TakesTheFormatOfANameThatIsTyped) {
+    Bench bench;
+    bench.Add({"a.avi"});
+    const struct {
+        const char* typed;
+        std::optional<QString> format;
+    } cases[] = {
+        {"x.MKV", "mkv"}, {"y", "mkv"}, {"y.avi.tar", "mkv"}, {"x.webm", "webm"}, {"x.mp4", std::nullopt}};
+    for (const auto& test : cases) {
+        bench.queue.SetTarget(bench.Id(0), bench.folder / test.typed);
+        EXPECT_EQ(bench.At(0).wishes.format, test.format) << test.typed;
+    }
+    bench.AwaitExamined();
+}
+
 TEST(Queue, TellsWhereSeveralMoviesGoToOneFile) {
     Bench bench;
     bench.Add({"a.avi", "b.avi", "c.avi"});

@@ -6,6 +6,7 @@
 #include <QSet>
 
 #include <algorithm>
+#include <filesystem>
 #include <utility>
 
 namespace movieconv::window {
@@ -215,8 +216,24 @@ void Queue::SetTarget(quint64 id, const std::string& typed) {
         AssignTarget(*entry);
     else
         MoveTarget(*entry, path);
+    TakeFormatOf(path, entry->wishes);
     AfterEdit(id);
     MakeRoomFor(*entry);
+}
+
+/// A typed extension tells the format, too.
+void Queue::TakeFormatOf(const std::string& path, Wishes& wishes) const {
+    const QString extension =
+        QString::fromStdString(std::filesystem::path(path).extension().string()).mid(1).toLower();
+    const std::vector<FormatFacts> formats = runner_.Formats();
+    const bool isFormat = std::any_of(formats.begin(), formats.end(), [&](const FormatFacts& format) {
+        return format.extension == extension;
+    });
+    if (!isFormat || extension == ExtensionFor(wishes))
+        return;
+    wishes.format.reset();
+    if (extension != ExtensionFor(wishes))
+        wishes.format = extension;
 }
 
 void Queue::SetReplace(quint64 id, bool replace) {

@@ -118,6 +118,7 @@ private:
     void TakeFound(const Entry& seen, const Entry& found);
     void AssignTarget(Entry& entry);
     void RenameForFormat(Entry& entry, const QString& before);
+    void TakeFormatOf(const std::string& path, Wishes& wishes) const;
     QStringList KnownExtensions() const;
     void MoveTarget(Entry& entry, const std::string& path);
     void MakeRoomFor(const Entry& named);
