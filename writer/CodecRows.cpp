@@ -5,6 +5,7 @@ namespace {
 
 constexpr QualityScale kCrf51{.kind = QualityKind::kCrf, .best = 0, .worst = 51};
 constexpr QualityScale kCrf63{.kind = QualityKind::kCrf, .best = 0, .worst = 63};
+constexpr QualityScale kLimited63{.kind = QualityKind::kLimitedCrf, .best = 0, .worst = 63};
 constexpr QualityScale kCapped63{.kind = QualityKind::kCappedCrf, .best = 4, .worst = 63};
 constexpr QualityScale kQuantiser{.kind = QualityKind::kQuantiser, .best = 1, .worst = 31};
 
@@ -67,7 +68,7 @@ constexpr std::array kPictureRows{
         .encoder = "libvpx-vp9",
         .deep = true,
         .threads = 1,
-        .quality = kCrf63,
+        .quality = kLimited63,
         .speed = kVpxSpeeds,
         .options = kVpxOptions,
     },

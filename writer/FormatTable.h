@@ -17,9 +17,10 @@ namespace writer {
 /// How an encoder is told a constant quality; less is better.
 enum class QualityKind {
     kNone,
-    kCrf,       ///< The encoder's option "crf".
-    kCappedCrf, ///< Likewise, below a bit rate that it needs as well.
-    kQuantiser  ///< The quantiser of every picture.
+    kCrf,        ///< The encoder's option "crf".
+    kLimitedCrf, ///< Likewise; an upper rate is its bit rate.
+    kCappedCrf,  ///< Likewise, and it always needs one.
+    kQuantiser   ///< The quantiser of every picture.
 };
 
 struct QualityScale {

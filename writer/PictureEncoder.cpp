@@ -54,23 +54,45 @@ void SetSpeed(AVCodecContext& context, const SpeedScale& scale, const PictureSet
     context.gop_size = std::max(1, static_cast<int>(std::lround(av_q2d(settings.rate) * kKeyFrameSeconds)));
 }
 
-void SetQuality(AVCodecContext& context, const QualityScale& scale, double quality) {
-    constexpr double kMostBitsPerPixel = 0.5; // more than the best quality needs
+/// The rate beside a constant quality, which the upper one limits and the usual one does not.
+int64_t RateBeside(const QualityScale& scale, const PictureSettings& settings) {
+    constexpr double kUncodedBits = 12; // of a pixel: what no quality needs
+    constexpr double kMost = 1e9;       // that encoders reckon with
+    const int64_t upper = std::max<int64_t>(settings.maxBitrate, 0);
     switch (scale.kind) {
-    case QualityKind::kNone:
-        break;
     case QualityKind::kQuantiser:
+        return upper > 0 ? std::min<int64_t>(upper, settings.bitrate) : settings.bitrate;
+    case QualityKind::kCappedCrf:
+        return upper > 0 ? upper
+                         : std::llround(std::min(kMost, kUncodedBits * settings.width * settings.height *
+                                                            av_q2d(settings.rate)));
+    case QualityKind::kLimitedCrf:
+        return upper;
+    case QualityKind::kNone:
+    case QualityKind::kCrf:
+        break;
+    }
+    return 0;
+}
+
+void SetRates(AVCodecContext& context, const PictureCodec& codec, const PictureSettings& settings) {
+    context.bit_rate = settings.quality ? RateBeside(codec.quality, settings) : settings.bitrate;
+    if (settings.maxBitrate <= 0)
+        return;
+    context.rc_max_rate = std::max<int64_t>(settings.maxBitrate, context.bit_rate);
+    context.rc_buffer_size = static_cast<int>(std::min<int64_t>(context.rc_max_rate * 2, INT32_MAX));
+    // SVT-AV1 takes equal ones for a constant rate, which it has only where pictures are coded in their
+    // order.
+    if (codec.id == AV_CODEC_ID_AV1 && context.rc_max_rate == context.bit_rate)
+        ++context.rc_max_rate;
+}
+
+void SetQuality(AVCodecContext& context, const QualityScale& scale, double quality) {
+    if (scale.kind == QualityKind::kQuantiser) {
         context.flags |= AV_CODEC_FLAG_QSCALE;
         context.global_quality = static_cast<int>(std::lround(FF_QP2LAMBDA * quality));
-        break;
-    case QualityKind::kCappedCrf:
-    case QualityKind::kCrf:
+    } else if (scale.kind != QualityKind::kNone) {
         SetOption(context, "crf", std::to_string(quality));
-        context.bit_rate = scale.kind == QualityKind::kCrf
-                               ? 0
-                               : std::llround(kMostBitsPerPixel * context.width * context.height *
-                                              av_q2d(context.framerate));
-        break;
     }
 }
 
@@ -86,11 +108,7 @@ av::CodecContext OpenWith(const PictureCodec& codec, const PictureSettings& sett
     context.framerate = av_d2q(av_q2d(settings.rate), 60000);
     context.time_base = av_inv_q(context.framerate);
     context.sample_aspect_ratio = settings.sampleAspect;
-    context.bit_rate = settings.bitrate;
-    if (settings.maxBitrate > 0) {
-        context.rc_max_rate = std::max(settings.maxBitrate, settings.bitrate);
-        context.rc_buffer_size = static_cast<int>(std::min<int64_t>(context.rc_max_rate * 2, INT32_MAX));
-    }
+    SetRates(context, codec, settings);
     context.thread_count = settings.threads;
     if (settings.inOrder) {
         context.max_b_frames = 0;

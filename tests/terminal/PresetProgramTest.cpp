@@ -5,10 +5,13 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
+#include <cstdint>
 #include <cstdlib>
 #include <filesystem>
 #include <ostream>
 #include <string>
+#include <tuple>
 
 namespace {
 
@@ -155,12 +158,36 @@ TEST(ProgramPresets, AreTheStandardAndGiveWayToOptions) {
     EXPECT_NE(size({"--speed", "slow"}), size({"--speed", "fastest"}));
 }
 
+// A quality is what pictures get however hard they are to code, unless an upper rate is too low for it.
+TEST(ProgramQuality, IsTheEncodersAndLimitedByAnUpperRateAlone) {
+    const Folder folder;
+    for (const auto& [codec, good, bad] : {std::tuple{"H264", "4", "30"},
+                                           {"VP90", "4", "40"},
+                                           {"VP80", "4", "40"},
+                                           {"AV01", "4", "40"},
+                                           {"XVID", "1", "20"}}) {
+        SCOPED_TRACE(codec);
+        const auto size = [&, codec = codec](const Args& rates) {
+            const Result result = Call(
+                Join(Args{"-q", "-y", "--no-audio", "--length", "0.5", "--speed", "fastest"},
+                     Join(Args{"--video-codec", codec}, rates), Args{Grainy("160x120"), folder / "o.mkv"}));
+            EXPECT_EQ(result.code, 0) << result.err;
+            return static_cast<int64_t>(fs::file_size(folder / "o.mkv"));
+        };
+        const int64_t free = size({"--quality", good});
+        EXPECT_GT(free, 3 * size({"--quality", bad}));
+        EXPECT_LT(size({"--quality", good, "--video-max-rate", "100k"}), std::min<int64_t>(45'000, free));
+        EXPECT_LT(size({"--video-rate", "100k", "--video-max-rate", "100k"}), 45'000);
+    }
+}
+
 struct Sized {
     const char* name;
     const char* pictures; ///< An lavfi source; empty: none.
     const char* sound;
     int64_t most;
     const char* output = "o.mp4";
+    const char* preset = "standard";
 };
 
 // Sources that are hard to keep small, and some that are not.
@@ -173,6 +200,7 @@ TEST(ProgramMaxSize, IsNeverExceeded) {
         {"black", "color=black:s=640x360:r=25:d=6", "sine=d=6", 100'000},
         {"fractal", "mandelbrot=s=480x360:r=25,trim=duration=5", "sine=d=5", 120'000},
         {"life", "life=s=320x240:r=25:mold=10,trim=duration=5", "sine=d=5", 120'000, "o.mkv"},
+        {"modern", "mandelbrot=s=320x240:r=25,trim=duration=3", "sine=d=3", 90'000, "o.mkv", "av1"},
         {"silent", "testsrc2=s=320x240:r=25:d=6", "", 100'000, "o.ts"},
         {"short", "testsrc2=s=640x360:r=25:d=0.4", "sine=d=0.4", 60'000},
         {"tall", "testsrc2=s=120x640:r=30:d=6", "sine=d=6", 100'000, "o.mov"},
@@ -189,7 +217,7 @@ TEST(ProgramMaxSize, IsNeverExceeded) {
         const Folder folder;
         const std::string output = folder / test.output;
         const Result result =
-            Call({"--preset", "standard", "--max-size", std::to_string(test.most), source, output});
+            Call({"--preset", test.preset, "--max-size", std::to_string(test.most), source, output});
         ASSERT_EQ(result.code, 0) << result.err;
         EXPECT_NE(result.err.find("to keep below"), std::string::npos) << result.err;
         EXPECT_LE(static_cast<int64_t>(fs::file_size(output)), test.most);
