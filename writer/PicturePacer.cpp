@@ -60,7 +60,7 @@ PicturePacer::Showing PicturePacer::Add(int64_t time) {
 }
 
 int64_t PicturePacer::Stay(int64_t tick, int64_t time, int64_t length) const {
-    return std::max<int64_t>(1, PlaceOf(time + length) - tick);
+    return PlaceBehind(tick, time + length) - tick;
 }
 
 PicturePacer::Showing PicturePacer::Finish(int64_t end, bool more) {
@@ -96,12 +96,18 @@ int64_t PicturePacer::PlaceOf(int64_t time) const {
                : av_rescale_q(time, kUnit, clock_.tick);
 }
 
+/// Where the grid's place is taken, as by a picture that a cut shortened, times are kept as they are.
+int64_t PicturePacer::PlaceBehind(int64_t tick, int64_t time) const {
+    const int64_t place = PlaceOf(time);
+    return std::max(tick + 1, place > tick ? place : av_rescale_q(time, kUnit, clock_.tick));
+}
+
 /// Nothing for a picture that is left out: where pictures tell the time, those that come faster than the rate
 /// would make it fall behind the sound.
 std::optional<int64_t> PicturePacer::TickOf(int64_t time) const {
-    const int64_t value = PlaceOf(time);
-    const int64_t tick = lastTick_ ? std::max(value, *lastTick_ + 1) : value;
-    const bool isLate = tick > value && av_rescale_q(tick, clock_.tick, kUnit) - time >= PictureLength();
+    const int64_t place = PlaceOf(time);
+    const int64_t tick = lastTick_ ? PlaceBehind(*lastTick_, time) : place;
+    const bool isLate = tick > place && av_rescale_q(tick, clock_.tick, kUnit) - time >= PictureLength();
     return clock_.ticksPerPicture == 1 && isLate ? std::nullopt : std::optional(tick);
 }
 

@@ -62,6 +62,7 @@ public:
 private:
     int64_t PictureLength() const;
     int64_t PlaceOf(int64_t time) const;
+    int64_t PlaceBehind(int64_t tick, int64_t time) const;
     std::optional<int64_t> TickOf(int64_t time) const;
     int64_t GridIndex(int64_t time) const;
     Showing ShowUntil(int64_t index);
