@@ -303,6 +303,8 @@ private:
             line += "\\N" + WordsOf(texts[i]);
         if (WordsOf(line).empty())
             return;
+        if (encoder_->codec_id == AV_CODEC_ID_WEBVTT)
+            line = Escaped(line);
         AVSubtitleRect rect{};
         rect.type = SUBTITLE_ASS;
         rect.ass = line.data();
@@ -323,6 +325,25 @@ private:
         std::copy_n(coded.begin(), size, packet_->data);
         HandOn(*packet_, begin, end - begin);
         av_packet_unref(packet_.get());
+    }
+
+    /// An event whose words mean themselves to readers of WebVTT, which FFmpeg's encoder does not see to.
+    static std::string Escaped(const std::string& event) {
+        std::string escaped = event.substr(0, event.size() - WordsOf(event).size());
+        for (size_t at = escaped.size(); at < event.size(); ++at) {
+            if (event.compare(at, 2, "{\\") == 0) { // an order, which is no text
+                const size_t end = std::min(event.find('}', at), event.size() - 1);
+                escaped.append(event, at, end - at + 1);
+                at = end;
+                continue;
+            }
+            const char letter = event[at];
+            escaped += letter == '&'   ? "&amp;"
+                       : letter == '<' ? "&lt;"
+                       : letter == '>' ? "&gt;"
+                                       : std::string(1, letter);
+        }
+        return escaped;
     }
 
     /// What is behind the commas that part the fields of an event.

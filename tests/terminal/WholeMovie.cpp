@@ -55,7 +55,7 @@ constexpr const char* kSignsFile =
     "Shadow, Alignment, MarginL, MarginR, MarginV, Encoding\n"
     "Style: Default,DejaVu Sans,20,&H00FFFFFF,&H0,&H0,&H0,0,0,0,0,100,100,0,0,1,1,0,2,5,5,5,1\n\n"
     "[Events]\nFormat: Layer, Start, End, Style, Name, MarginL, MarginR, MarginV, Effect, Text\n"
-    "Dialogue: 0,0:00:00.30,0:00:01.50,Default,,0,0,0,,{\\pos(20,20)}A sign\n"
+    "Dialogue: 0,0:00:00.30,0:00:01.50,Default,,0,0,0,,{\\pos(20,20)}A &lt; sign\n"
     "Dialogue: 1,0:00:01.00,0:00:02.00,Default,Anna,0,0,0,,{\\b1}Bold{\\b0} and plain\n";
 constexpr const char* kNotesFile =
     ";FFMETADATA1\ntitle=The whole\nartist=Nobody & S\xC3\xB6hne\nalbum=Collected\n"

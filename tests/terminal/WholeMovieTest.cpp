@@ -206,9 +206,9 @@ const std::vector<Cue> kWords{{500, 1200, "Plain words"},
                               {1400, 2400,
                                "Gr\xC3\xBC\xC3\x9F"
                                "e, \xD0\xB4\xD0\xB2\xD0\xB0"}};
-const std::vector<Cue> kSigns{{300, 1500, "A sign"}, {1000, 2000, "Bold and plain"}};
+const std::vector<Cue> kSigns{{300, 1500, "A &lt; sign"}, {1000, 2000, "Bold and plain"}};
 const std::vector<Cue> kSignsInARow{
-    {300, 1000, "A sign"}, {1000, 1500, "A sign Bold and plain"}, {1500, 2000, "Bold and plain"}};
+    {300, 1000, "A &lt; sign"}, {1000, 1500, "A &lt; sign Bold and plain"}, {1500, 2000, "Bold and plain"}};
 
 void ExpectSubtitles(const Room& room, const Json& probe, const Result& made, const std::string& path) {
     const std::vector<Json> subtitles = StreamsOf(probe, "subtitle");
@@ -331,7 +331,7 @@ TEST(WholeMovie, IsCutWithItsPictures) {
         const std::vector<Cue> signs = CuesOf(path("range"), 1);
         EXPECT_TRUE(IsNear(
             signs, inARow ? std::vector<Cue>{{0, 500, kSignsInARow[1].text}, {500, 1000, "Bold and plain"}}
-                          : std::vector<Cue>{{0, 500, "A sign"}, {0, 1000, "Bold and plain"}}))
+                          : std::vector<Cue>{{0, 500, "A &lt; sign"}, {0, 1000, "Bold and plain"}}))
             << Show(signs);
         const Json range = whole_movie::Probe(path("range"));
         ASSERT_EQ(range["chapters"].size(), 1);
