@@ -42,7 +42,7 @@ uint32_t SoundCodecFor(const Request& request, const FileFormatInfo& format);
 /// Most bits that a component can have in the output's pictures, 8 or 10.
 int MostDepth(const Request& request, const FileFormatInfo& format);
 
-/// Whether the size of the output follows from bit rates.
+/// Whether the size of the pictures, if there are any, follows from bit rates.
 bool HasRates(const Request& request, const FileFormatInfo& format, const SourceInfo& source);
 
 /// Throws Failure as well when the codec has no such quality or depth.

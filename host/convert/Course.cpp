@@ -1,7 +1,6 @@
 #include "host/convert/Course.h"
 
 #include "host/convert/Amounts.h"
-#include "host/convert/CodecPlan.h"
 #include "host/convert/EncodePlan.h"
 #include "host/convert/Judgement.h"
 #include "host/convert/OutputCheck.h"
@@ -148,13 +147,12 @@ void Course::AwaitResume() {
 
 /// Before anything is converted.
 void Course::LookAtRoom() {
-    if (!HasRates(request_, ChooseFormat(request_), movie_.Info())) {
-        room_.Forecast();
-        return;
-    }
     EncodeParam param{};
     MCGetEncodeParam(engine_.get(), &param);
-    room_.CheckKnown(MCGetEstimateDiskSpaceEx(&param, length_));
+    if (const std::optional<int64_t> needed = NeededBytes(param, request_, movie_.Info(), length_))
+        room_.CheckKnown(*needed);
+    else
+        room_.Forecast();
 }
 
 /// The engine's worker calls this.

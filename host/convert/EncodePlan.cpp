@@ -107,8 +107,6 @@ EncodeParam PlanEncoding(const EncodeParam& defaults, const FileFormatInfo& form
     if (request.copySound && param.bNoAudio == 0) {
         const StreamInfo& sound = source.streams[static_cast<std::size_t>(source.sound->index)];
         RequireCopyable(format, request, sound, param.bNoVideo == 0);
-        if (sound.bitRate > 0 && sound.bitRate < INT32_MAX) // for the estimate
-            param.nAudioBitrate = static_cast<int32_t>(sound.bitRate);
     }
     return param;
 }

@@ -1,7 +1,6 @@
 #include "host/convert/Room.h"
 
 #include "host/convert/Amounts.h"
-#include "host/convert/CodecPlan.h"
 #include "host/convert/EncodePlan.h"
 #include "host/convert/Engine.h"
 #include "host/convert/Failure.h"
@@ -40,8 +39,7 @@ Room EstimateRoom(const Request& request) {
     EncodeParam param{};
     MCGetEncodeParam(engine.get(), &param);
     const std::string folder = text::FolderOf(request.output);
-    const bool known = HasRates(fitted, ChooseFormat(fitted), movie.Info());
-    return {length, known ? MCGetEstimateDiskSpaceEx(&param, length) : -1, folder, FreeBytes(folder)};
+    return {length, NeededBytes(param, fitted, movie.Info(), length).value_or(-1), folder, FreeBytes(folder)};
 }
 
 } // namespace movieconv

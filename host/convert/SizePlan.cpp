@@ -1,5 +1,6 @@
 #include "host/convert/SizePlan.h"
 
+#include "api/MovieConv.h"
 #include "host/convert/Amounts.h"
 #include "host/convert/CarryPlan.h"
 #include "host/convert/CodecPlan.h"
@@ -14,6 +15,8 @@
 #include <cmath>
 #include <cstdint>
 #include <fmt/format.h>
+#include <numeric>
+#include <vector>
 
 namespace movieconv {
 namespace {
@@ -43,12 +46,49 @@ double LeastBitsPerPixel(uint32_t codec) {
     return IsAmong(codec, {FourCC("H264"), FourCC("HEVC"), FourCC("VP90"), FourCC("AV01")}) ? kModern : kOld;
 }
 
+bool IsLossless(uint32_t soundCodec) {
+    return IsAmong(soundCodec, {FourCC("PCM "), FourCC("FLAC"), FourCC("ALAC")});
+}
+
+double UncodedRate(const SoundPlan& plan, const SoundStreamInfo& source) {
+    return static_cast<double>(plan.sampleRate.value_or(source.sampleRate)) *
+           plan.channels.value_or(source.channels) * source.bitsPerSample;
+}
+
+/// Bits per second of a stream of sound in the output; 0 where what is heard decides them.
+double SoundRate(const Request& request, const FileFormatInfo& format, const SoundStreamInfo& sound,
+                 int64_t codedRate) {
+    if (request.copySound)
+        return static_cast<double>(codedRate);
+    const SoundPlan plan = PlanSound(request, format, sound);
+    if (plan.codec == FourCC("PCM "))
+        return UncodedRate(plan, sound);
+    return IsLossless(plan.codec) ? 0 : plan.rate.value_or(kUsualAudioBitrate);
+}
+
+/// Of all tracks.
+std::optional<double> SoundRates(const Request& request, const FileFormatInfo& format,
+                                 const SourceInfo& source) {
+    const std::vector<int> further = CarryPlan(source, request, format).FurtherSound();
+    const auto isMain = [&](const StreamInfo& stream) { return stream.index == source.sound->index; };
+    const auto main = std::find_if(source.streams.begin(), source.streams.end(), isMain);
+    std::vector<double> rates{
+        SoundRate(request, format, *source.sound, main == source.streams.end() ? 0 : main->bitRate)};
+    for (const int index : further) {
+        const StreamInfo& stream = source.streams.at(static_cast<std::size_t>(index));
+        rates.push_back(SoundRate(request, format, stream.sound.value(), stream.bitRate));
+    }
+    if (std::find(rates.begin(), rates.end(), 0) != rates.end())
+        return std::nullopt;
+    return std::accumulate(rates.begin(), rates.end(), 0.0);
+}
+
 /// Sets the sound's rate, `share` at most where that is enough; what it can take at most, in bits per second.
 double FitSound(Request& request, const FileFormatInfo& format, const SoundStreamInfo& source, double share) {
     SoundPlan plan = PlanSound(request, format, source);
     const double sampleRate = plan.sampleRate.value_or(source.sampleRate);
-    if (IsAmong(plan.codec, {FourCC("PCM "), FourCC("FLAC"), FourCC("ALAC")}))
-        return sampleRate * plan.channels.value_or(source.channels) * source.bitsPerSample;
+    if (IsLossless(plan.codec))
+        return UncodedRate(plan, source);
     const double least = kLeastSoundBits * sampleRate;
     if (!request.channels && share < least * plan.channels.value_or(source.channels)) {
         request.channels = share < least * 2 ? 1 : std::min(2, source.channels);
@@ -113,6 +153,23 @@ Request FitIntoSize(Request request, const SourceInfo& source) {
     if (pictures)
         FitPictures(request, format, *source.pictures, pictureRate);
     return request;
+}
+
+std::optional<int64_t> NeededBytes(EncodeParam param, const Request& request, const SourceInfo& source,
+                                   double length) {
+    const FileFormatInfo& format = ChooseFormat(request);
+    if (!HasRates(request, format, source))
+        return std::nullopt;
+    if (param.bNoAudio == 0) {
+        const std::optional<double> rate = SoundRates(request, format, source);
+        if (!rate)
+            return std::nullopt;
+        const double tracks = *rate / std::max(1, int32_t{param.nAudioBitrate});
+        param.nAudioBitrate = static_cast<int32_t>(std::min<double>(*rate, INT32_MAX));
+        param.nAudioMaxBitrate =
+            static_cast<int32_t>(std::min<double>(param.nAudioMaxBitrate * tracks, INT32_MAX));
+    }
+    return MCGetEstimateDiskSpaceEx(&param, length);
 }
 
 std::string TellSize(const Request& fitted) {

@@ -4,7 +4,10 @@
 
 #include "host/convert/Request.h"
 #include "host/source/Source.h"
+#include "media/EncodeParam.h"
 
+#include <cstdint>
+#include <optional>
 #include <string>
 
 namespace movieconv {
@@ -12,6 +15,11 @@ namespace movieconv {
 /// The request with rates, and where those are low a picture size and channels, that follow from its greatest
 /// size and the source's length; without one as it is. Throws Failure when no such rates are possible.
 Request FitIntoSize(Request request, const SourceInfo& source);
+
+/// Bytes that an output of that length is going to take, about, coded as `param` says; nothing where what is
+/// seen or heard decides it.
+std::optional<int64_t> NeededBytes(EncodeParam param, const Request& request, const SourceInfo& source,
+                                   double length);
 
 /// What was chosen, a sentence for people.
 std::string TellSize(const Request& fitted);

@@ -146,6 +146,41 @@ TEST(CodecPlan, KnowsTheCodecThatNobodyChose) {
     }
 }
 
+TEST(NeededBytes, CountAllTracksAndAreNotKnownWhereSoundDecides) {
+    SourceInfo source = Source(10);
+    source.pictures.reset();
+    for (int index = 0; index < 2; ++index) {
+        StreamInfo track;
+        track.index = index;
+        track.kind = StreamKind::kSound;
+        track.codec = "ac3";
+        track.decodable = true;
+        track.bitRate = index == 0 ? 448'000 : 64'000;
+        track.sound = source.sound;
+        track.sound->index = index;
+        source.streams.push_back(track);
+    }
+    source.sound = source.streams[0].sound;
+    const struct {
+        const char* output;
+        bool copies;
+        std::optional<int64_t> bytes; // of ten seconds
+    } cases[] = {{"o.mp3", false, 160'000},
+                 {"o.m4a", false, 320'000},
+                 {"o.wav", false, 10 * 48'000 * 6 * 2},
+                 {"o.flac", false, std::nullopt},
+                 {"o.mka", true, 640'000}};
+    for (const auto& test : cases) {
+        SCOPED_TRACE(test.output);
+        Request request = To(test.output);
+        request.copySound = test.copies;
+        EncodeParam param{};
+        param.bNoVideo = 1;
+        param.nAudioBitrate = 128'000;
+        EXPECT_EQ(NeededBytes(param, request, source, 10), test.bytes);
+    }
+}
+
 TEST(CodecPlan, RefusesWhatFormatOrCodecDoesNotHave) {
     const std::pair codec{Category::kRequest, Reason::kCodec};
     const std::pair other{Category::kRequest, Reason::kOther};
