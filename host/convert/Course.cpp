@@ -56,7 +56,7 @@ Course::Course(const Request& request, Movie& movie, Wishes& wishes, Observer& o
     if (request.piece && request.piece->pictures)
         movie.EndPicturesAt(ToSeconds(request.piece->until));
     else if (request.length)
-        movie.EndPicturesAt(request.begin + *request.length);
+        movie.EndAt(request.begin + *request.length);
     if (movie.Info().pictures)
         wishes.pictures.Expect(*movie.Info().pictures, movie.KeepsHdr());
 }
@@ -84,7 +84,7 @@ Verdict Course::Run() {
     if (request_.firstClip)
         RunClip();
     else
-        RunEngine(request_.begin, request_.length.value_or(0));
+        RunEngine(request_.begin, request_.length ? std::max(*request_.length, kLeastLength) : 0);
     while (GoesOn())
         RunClip();
     return Conclude();

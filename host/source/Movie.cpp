@@ -44,6 +44,12 @@ void Movie::EndPicturesAt(double seconds) {
         stamps_->EndAt(seconds);
 }
 
+void Movie::EndAt(double seconds) {
+    EndPicturesAt(seconds);
+    if (sound_)
+        sound_->EndAt(seconds);
+}
+
 void Movie::Stop() {
     beside_.Stop();
     // Before the demuxer, lest a decoder take the stop for the source's end and hand on what belongs there;

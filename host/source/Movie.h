@@ -42,9 +42,10 @@ public:
     /// PictureDecoder::TimeOfNext; nothing without pictures.
     std::optional<int64_t> TimeOfNextPicture() { return pictures_ ? pictures_->TimeOfNext() : std::nullopt; }
 
-    /// Leaves out the pictures from that time on, where the engine would write one more. Only before the
-    /// conversion.
+    /// Leaves out the pictures from that time on, where the engine would write one more; EndAt the sound,
+    /// too, of which it would write the rest of a block. Only before the conversion.
     void EndPicturesAt(double seconds);
+    void EndAt(double seconds);
 
     /// The streams that go into the output beside Pictures() and Sound().
     BesideTracks& Beside() { return beside_; }

@@ -1,6 +1,5 @@
 #include "host/source/SoundDecoder.h"
 
-#include "host/source/MediaTime.h"
 #include "host/source/SoundBlock.h"
 #include "host/source/SourceTime.h"
 
@@ -65,8 +64,19 @@ double SoundDecoder::SecondsDelivered() const {
     return static_cast<double>(samplesDelivered_) / info_.format.nSampleRate;
 }
 
+/// Up to where it is to end.
+int64_t SoundDecoder::BytesLeft() const {
+    if (!end_)
+        return blockBytes_;
+    const int64_t samples = av_rescale(*end_ - begin_, info_.format.nSampleRate, kTicksPerSecond);
+    return (samples - samplesDelivered_) * frameBytes_;
+}
+
 AudioFrame* SoundDecoder::GetNextFrame() {
     if (!thread_.joinable() && !failures_.Attempt([this] { thread_ = NewThread([this] { Run(); }); }))
+        return nullptr;
+    const int64_t most = std::min(BytesLeft(), blockBytes_);
+    if (most <= 0)
         return nullptr;
     while (used_ == static_cast<int64_t>(current_.size())) {
         std::optional<PcmDecoder::Chunk> next = queue_.Pop();
@@ -76,7 +86,7 @@ AudioFrame* SoundDecoder::GetNextFrame() {
         used_ = 0;
     }
     const int64_t left = static_cast<int64_t>(current_.size()) - used_;
-    const int64_t bytes = std::min(left, blockBytes_);
+    const int64_t bytes = std::min(left, most);
     const AudioFormat& format = info_.format;
     block_ = BlockOf(format, kMediaTypeSound);
     block_.pData = current_.data() + used_;

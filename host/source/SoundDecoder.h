@@ -6,12 +6,14 @@
 
 #include "host/source/Demuxer.h"
 #include "host/source/Failures.h"
+#include "host/source/MediaTime.h"
 #include "host/source/PcmDecoder.h"
 #include "host/source/Source.h"
 #include "media/Decoders.h"
 #include "thread/BoundedQueue.h"
 
 #include <atomic>
+#include <optional>
 #include <thread>
 #include <vector>
 
@@ -28,6 +30,9 @@ public:
     double Seek(double seconds) override;
     AudioFrame* GetNextFrame() override;
 
+    /// The last sample is the one before that time. Before the first block is asked for.
+    void EndAt(double seconds) { end_ = ToMediaTime(seconds); }
+
     /// Makes the sound end now. Any thread.
     void Stop() { queue_.Close(); }
 
@@ -41,6 +46,7 @@ public:
     bool RanDry() const { return ranDry_; }
 
 private:
+    int64_t BytesLeft() const;
     void Run();
     void DecodeAll();
     bool PushSilence(int64_t samples);
@@ -54,6 +60,7 @@ private:
     int64_t frameBytes_ = 0; // of one sample of all channels
     int64_t blockBytes_ = 0;
     int64_t begin_ = 0;
+    std::optional<int64_t> end_;
 
     // The decoding thread's.
     PcmDecoder decoder_;

@@ -155,6 +155,24 @@ TEST(Times, OfTheLastPictureLastAsLongAsItsSourceTells) {
     EXPECT_NEAR(EndOf(inspect::LookAt(folder / "clip_01.mp4")), 3, 0.05);
 }
 
+TEST(Times, OfThePartAskedForAreExact) {
+    const std::string source = Make("plain.mkv", Join(CountedPictures(2), Beeps(2), NearLossless()));
+    const struct {
+        const char* begin;
+        const char* length;
+        double seconds;
+        std::size_t pictures;
+    } cases[] = {{"0.5", "1", 1, 26}, {"0.3", "0.123", 0.123, 4}, {"0", "0.001", 0.001, 1}};
+    for (const auto& [begin, length, seconds, pictures] : cases) {
+        SCOPED_TRACE(length);
+        const Seen seen =
+            Convert(source, {"--begin", begin, "--length", length, "--audio-codec", "PCM"}, "mov");
+        EXPECT_EQ(static_cast<long>(seen.sound.size()), std::lround(seconds * 44100));
+        ASSERT_EQ(seen.pictures.size(), pictures);
+        EXPECT_NEAR(EndOf(seen), seconds, 0.001);
+    }
+}
+
 // MPEG-2 has few rates; one that nobody asked for is brought to the next one.
 TEST(Times, OfAviAreKeptWhereFewPicturesCome) {
     const std::string source =
