@@ -34,9 +34,10 @@ void PrintWhole(const StandardStreams& streams, const std::string& text) {
 
 std::string TellNeeded(const Room& room) {
     return room.needed < 0
-               ? fmt::format("how much {} of output need is unknown: the quality decides, not a rate;\n"
-                             "the conversion tells it after its first ten seconds\n",
-                             FormatTime(room.length, true))
+               ? fmt::format(
+                     "how much {} of output need is unknown: what is seen and heard decides, not a rate;\n"
+                     "the conversion tells it after its first ten seconds\n",
+                     FormatTime(room.length, true))
                : fmt::format("needs about {} for {} of output\n", FormatBytes(room.needed),
                              FormatTime(room.length, true));
 }
