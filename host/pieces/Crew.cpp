@@ -115,6 +115,7 @@ void Crew::Run() noexcept {
 void Crew::WorkOff(int atOnce) {
     clock_.Skip(WorkClock::Now());
     for (;;) {
+        TickAfterWait();
         FollowWishes();
         const Mood mood = HowToGoOn();
         if (mood == Mood::kBreaksOff)
@@ -131,9 +132,9 @@ void Crew::WorkOff(int atOnce) {
         if (hands_.empty() && (mood != Mood::kGoesOn || !HasMore()))
             return;
         Report();
+        TickAfterWait(); // all of this is short: what takes long is that the whole process was suspended
         TickClock(AllWaitForRoom());
         bell_.Wait(paused_ ? std::nullopt : std::optional(WorkClock::kTick));
-        TickAfterWait();
         TakeEnded();
     }
 }
