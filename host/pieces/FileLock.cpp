@@ -15,12 +15,12 @@ namespace movieconv {
 namespace {
 
 /// On network file systems a lock takes the right to write, which nobody has to another user's file, nor to a
-/// folder.
+/// folder. Where a file may be made, a folder is something else in its place.
 int OpenToLock(const std::string& path, int further) {
     constexpr int kFlags = O_CLOEXEC | O_NOFOLLOW | O_NONBLOCK;
     const int descriptor = open(path.c_str(), O_RDWR | kFlags | further, 0666);
-    return descriptor < 0 && (errno == EACCES || errno == EISDIR) ? open(path.c_str(), O_RDONLY | kFlags)
-                                                                  : descriptor;
+    const bool mayBeRead = errno == EACCES || (errno == EISDIR && (further & O_CREAT) == 0);
+    return descriptor < 0 && mayBeRead ? open(path.c_str(), O_RDONLY | kFlags) : descriptor;
 }
 
 FileLock::State Lock(int descriptor) {
