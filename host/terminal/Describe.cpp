@@ -89,7 +89,7 @@ std::string DescribeStream(const StreamInfo& stream, Certainty certainty) {
         text += fmt::format(", {} Hz, {} ({} channel{})", stream.sound->sampleRate, stream.sound->layout,
                             channels, channels == 1 ? "" : "s");
     }
-    if (stream.kind == StreamKind::kSubtitles)
+    if (stream.kind == StreamKind::kSubtitles && stream.codec != "none")
         text += stream.textual ? ", text" : ", bitmaps";
     if (!stream.language.empty())
         text += fmt::format(", {}", stream.languageTag.empty() ? stream.language : stream.languageTag);

@@ -85,10 +85,11 @@ TEST_F(EditingTest, CompletesNames) {
     const struct {
         QString typed;
         std::string target;
-    } cases[] = {{"mine.mkv", folder / "mine.mkv"},
-                 {"mine", folder / "mine.mp4"},
+    } cases[] = {{"mine", folder / "mine.mp4"},
                  {"mr. b. 1.5", folder / "mr. b. 1.5.mp4"},
                  {"more/mine.m4v", folder / "more/mine.m4v"},
+                 {"mine.mkv", folder / "mine.mkv"},
+                 {"yours", folder / "yours.mkv"}, // whose format is shown now
                  {"./more/../mine.mp4", folder / "mine.mp4"},
                  {"/elsewhere/mine.mp4", "/elsewhere/mine.mp4"},
                  {"~/mine.mp4", QDir::homePath().toStdString() + "/mine.mp4"}};

@@ -92,8 +92,8 @@ TEST(Queue, TakesTheFormatOfANameThatIsTyped) {
     const struct {
         const char* typed;
         std::optional<QString> format;
-    } cases[] = {
-        {"x.MKV", "mkv"}, {"y", "mkv"}, {"y.avi.tar", "mkv"}, {"x.webm", "webm"}, {"x.mp4", std::nullopt}};
+    } cases[] = {{"x.MKV", "mkv"},        {"y", "mkv"},     {"y.avi.tar", "mkv"},   {"x.webm", "webm"},
+                 {"x.mp4", std::nullopt}, {"x.mkv", "mkv"}, {"x.m4v", std::nullopt}};
     for (const auto& test : cases) {
         bench.queue.SetTarget(bench.Id(0), bench.folder / test.typed);
         EXPECT_EQ(bench.At(0).wishes.format, test.format) << test.typed;

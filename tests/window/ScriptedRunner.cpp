@@ -90,10 +90,10 @@ std::vector<PresetFacts> ScriptedRunner::Presets() {
 }
 
 std::vector<FormatFacts> ScriptedRunner::Formats() {
-    return {{QStringLiteral("mp4"), QStringLiteral("MP4"), true},
-            {QStringLiteral("mkv"), QStringLiteral("Matroska"), true},
-            {QStringLiteral("webm"), QStringLiteral("WebM"), true},
-            {QStringLiteral("m4a"), QStringLiteral("M4A"), false}};
+    return {{QStringLiteral("mp4"), QStringLiteral("MP4"), true, {QStringLiteral("m4v")}},
+            {QStringLiteral("mkv"), QStringLiteral("Matroska"), true, {}},
+            {QStringLiteral("webm"), QStringLiteral("WebM"), true, {}},
+            {QStringLiteral("m4a"), QStringLiteral("M4A"), false, {}}};
 }
 
 PresetFacts ScriptedRunner::LoadPreset(const std::string& path) {

@@ -226,14 +226,14 @@ void Queue::TakeFormatOf(const std::string& path, Wishes& wishes) const {
     const QString extension =
         QString::fromStdString(std::filesystem::path(path).extension().string()).mid(1).toLower();
     const std::vector<FormatFacts> formats = runner_.Formats();
-    const bool isFormat = std::any_of(formats.begin(), formats.end(), [&](const FormatFacts& format) {
-        return format.extension == extension;
+    const auto format = std::find_if(formats.begin(), formats.end(), [&](const FormatFacts& each) {
+        return each.extension == extension || each.furtherExtensions.contains(extension);
     });
-    if (!isFormat || extension == ExtensionFor(wishes))
+    if (format == formats.end() || format->extension == ExtensionFor(wishes))
         return;
     wishes.format.reset();
-    if (extension != ExtensionFor(wishes))
-        wishes.format = extension;
+    if (format->extension != ExtensionFor(wishes))
+        wishes.format = format->extension;
 }
 
 void Queue::SetReplace(quint64 id, bool replace) {

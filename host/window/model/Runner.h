@@ -57,6 +57,7 @@ struct FormatFacts {
     QString extension; ///< "mp4".
     QString name;      ///< For people.
     bool pictures = true;
+    QStringList furtherExtensions; ///< "m4v".
 };
 
 struct PresetFacts {

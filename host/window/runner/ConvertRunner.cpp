@@ -185,8 +185,9 @@ std::vector<FormatFacts> ConvertRunner::Formats() {
     for (const char* extension :
          {"mp4", "mkv", "mov", "webm", "avi", "ts", "flv", "gif", "m4a", "mp3", "flac", "ogg", "wav"})
         if (const FileFormatInfo* format = FindFormat(extension))
-            formats.push_back(
-                {QLatin1String(extension), QString::fromUtf8(format->szName), format->bHasVideo != 0});
+            formats.push_back({QLatin1String(extension), QString::fromUtf8(format->szName),
+                               format->bHasVideo != 0,
+                               QString::fromUtf8(format->szExtensions).split(QLatin1Char(',')).mid(1)});
     return formats;
 }
 
