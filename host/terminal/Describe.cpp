@@ -72,11 +72,14 @@ std::string DescribeFlags(const StreamFlags& flags) {
 }
 
 std::string DescribeStream(const StreamInfo& stream, Certainty certainty) {
+    const bool isKnown = stream.codec != "none";
     std::string text = fmt::format("{:>4}  {:<10} {}", stream.index, KindName(stream.kind),
-                                   stream.codec == "none" ? stream.fileName : stream.codec);
+                                   isKnown                   ? stream.codec
+                                   : stream.fileName.empty() ? "unknown"
+                                                             : stream.fileName);
     if (!stream.profile.empty())
         text += fmt::format(" ({})", stream.profile);
-    if (!stream.fileName.empty() && stream.codec != "none")
+    if (!stream.fileName.empty() && isKnown)
         text += fmt::format(", {}", stream.fileName);
     if (!stream.mimeType.empty())
         text += fmt::format(", {}", stream.mimeType);
@@ -89,7 +92,7 @@ std::string DescribeStream(const StreamInfo& stream, Certainty certainty) {
         text += fmt::format(", {} Hz, {} ({} channel{})", stream.sound->sampleRate, stream.sound->layout,
                             channels, channels == 1 ? "" : "s");
     }
-    if (stream.kind == StreamKind::kSubtitles && stream.codec != "none")
+    if (stream.kind == StreamKind::kSubtitles && isKnown)
         text += stream.textual ? ", text" : ", bitmaps";
     if (!stream.language.empty())
         text += fmt::format(", {}", stream.languageTag.empty() ? stream.language : stream.languageTag);

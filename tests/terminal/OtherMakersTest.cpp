@@ -325,4 +325,22 @@ TEST(OtherMakers, MatroskaIsReadToItsEnd) {
     EXPECT_EQ(whole_movie::Probe(folder / "c.mp4")["format"]["tags"].value("artist", ""), "Anna;Ben");
 }
 
+/// FFmpeg does not know WebVTT as it is in Matroska.
+TEST(OtherMakers, SubtitlesOfAnUnknownCodecAreCalledSoAndLeftBehind) {
+    if (program::Run({"sh", "-c", "command -v mkvmerge"}).code != 0)
+        GTEST_SKIP() << "without mkvmerge";
+    const Folder folder;
+    test_movies::Ffmpeg(Join(CountedPictures(1), Args{folder / "pictures.mkv"}));
+    WriteFile(folder / "a.vtt", "WEBVTT\n\n00:00.200 --> 00:00.800\nGood morning\n");
+    ASSERT_EQ(
+        program::Run({"mkvmerge", "-q", "-o", folder / "in.mkv", folder / "pictures.mkv", folder / "a.vtt"})
+            .code,
+        0);
+    const std::string told = Call({"--info", folder / "in.mkv"}).out;
+    EXPECT_NE(told.find("subtitles  unknown, default, no decoder\n"), std::string::npos) << told;
+    const Result made = Call({folder / "in.mkv", folder / "out.mkv", "--progress", "none"});
+    EXPECT_EQ(made.code, 0);
+    EXPECT_NE(made.err.find("not carried: subtitles"), std::string::npos) << made.err;
+}
+
 } // namespace
