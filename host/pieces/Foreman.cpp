@@ -287,11 +287,11 @@ void Foreman::Report() {
 /// Tells how far the joining is.
 Going Foreman::FollowJoining(const Joining& latest) {
     constexpr std::chrono::milliseconds kShortest{100}; // between two reports
-    FollowWishes();
     const bool waits = latest.waitsFor > 0;
     const bool waited = joining_ && joining_->waitsFor > 0;
     if (joining_) // before the first report comes work without waits
         TickAfterWait();
+    FollowWishes();
     TickClock(waits);
     if (Stopped())
         return Going::kEnds;

@@ -28,8 +28,7 @@ enum class Going { kOn, kPaused, kEnds };
 
 /// Checks every piece and joins them. `follow` is told of it on this thread, again and again and whenever
 /// `bell` is rung, and may have it wait, until the bell is rung, or end it; the output's name is not touched
-/// then. Throws Failure; the text names the
-/// pieces that do not belong there.
+/// then. Throws Failure; the text names the pieces that do not belong there.
 Verdict JoinPieces(const Plan& plan, const std::string& planPath, const JoinOrder& order, Observer& observer,
                    Bell& bell, const std::function<Going(const Joining&)>& follow);
 

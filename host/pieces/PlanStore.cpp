@@ -12,7 +12,6 @@
 #include <filesystem>
 #include <fmt/format.h>
 #include <system_error>
-#include <unistd.h>
 
 namespace movieconv {
 
@@ -58,8 +57,9 @@ PlanStore::Leftover PlanStore::Take(const Plan& now, const Request& request, IfT
                                   before->Pieces(), path_),
                       Reason::kLeftover);
     RemovePieces(path_, request);
-    if (planned)
-        unlink(path_.c_str());
+    if (std::error_code error; planned && !remove(std::filesystem::path(path_), error) && error)
+        throw Failure(Category::kOutput,
+                      fmt::format("\"{}\" of an earlier run cannot be removed: {}", path_, error.message()));
     if (resume || (!planned && pieces == 0))
         return {};
     return {std::nullopt,
