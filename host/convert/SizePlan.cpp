@@ -69,15 +69,13 @@ double SoundRate(const Request& request, const FileFormatInfo& format, const Sou
 /// Of all tracks.
 std::optional<double> SoundRates(const Request& request, const FileFormatInfo& format,
                                  const SourceInfo& source) {
-    const std::vector<int> further = CarryPlan(source, request, format).FurtherSound();
-    const auto isMain = [&](const StreamInfo& stream) { return stream.index == source.sound->index; };
-    const auto main = std::find_if(source.streams.begin(), source.streams.end(), isMain);
+    const auto streamOf = [&](int index) -> const StreamInfo& {
+        return source.streams.at(static_cast<std::size_t>(index));
+    };
     std::vector<double> rates{
-        SoundRate(request, format, *source.sound, main == source.streams.end() ? 0 : main->bitRate)};
-    for (const int index : further) {
-        const StreamInfo& stream = source.streams.at(static_cast<std::size_t>(index));
-        rates.push_back(SoundRate(request, format, stream.sound.value(), stream.bitRate));
-    }
+        SoundRate(request, format, *source.sound, streamOf(source.sound->index).bitRate)};
+    for (const int index : CarryPlan(source, request, format).FurtherSound())
+        rates.push_back(SoundRate(request, format, streamOf(index).sound.value(), streamOf(index).bitRate));
     if (std::find(rates.begin(), rates.end(), 0) != rates.end())
         return std::nullopt;
     return std::accumulate(rates.begin(), rates.end(), 0.0);

@@ -64,18 +64,18 @@ double SoundDecoder::SecondsDelivered() const {
     return static_cast<double>(samplesDelivered_) / info_.format.nSampleRate;
 }
 
-/// Up to where it is to end.
-int64_t SoundDecoder::BytesLeft() const {
+/// Of the next block at most; 0 or less where the sound is to end.
+int64_t SoundDecoder::MostBytes() const {
     if (!end_)
         return blockBytes_;
-    const int64_t samples = av_rescale(*end_ - begin_, info_.format.nSampleRate, kTicksPerSecond);
-    return (samples - samplesDelivered_) * frameBytes_;
+    const int64_t samples = SamplesIn(*end_ - begin_, info_.format.nSampleRate);
+    return std::min(blockBytes_, (samples - samplesDelivered_) * frameBytes_);
 }
 
 AudioFrame* SoundDecoder::GetNextFrame() {
     if (!thread_.joinable() && !failures_.Attempt([this] { thread_ = NewThread([this] { Run(); }); }))
         return nullptr;
-    const int64_t most = std::min(BytesLeft(), blockBytes_);
+    const int64_t most = MostBytes();
     if (most <= 0)
         return nullptr;
     while (used_ == static_cast<int64_t>(current_.size())) {

@@ -46,7 +46,7 @@ public:
     bool RanDry() const { return ranDry_; }
 
 private:
-    int64_t BytesLeft() const;
+    int64_t MostBytes() const;
     void Run();
     void DecodeAll();
     bool PushSilence(int64_t samples);
