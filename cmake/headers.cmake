@@ -19,6 +19,8 @@ set(public_headers
   host/convert/Request.h
   host/convert/Room.h
   host/convert/Work.h
+  host/sentence/Sentence.h
+  host/sentence/SentenceError.h
   host/source/Crop.h
   host/source/Deinterlace.h
   host/source/TrackWishes.h
@@ -38,7 +40,7 @@ set(public_headers
 set(public_header_dir ${PROJECT_BINARY_DIR}/include/movieconv)
 foreach(header IN LISTS public_headers)
   file(READ ${PROJECT_SOURCE_DIR}/${header} text)
-  set(module "(Common/Image|api|engine|host/convert|host/source|logsink|media|platform|thread|writer)")
+  set(module "(Common/Image|api|engine|host/convert|host/sentence|host/source|logsink|media|platform|thread|writer)")
   string(REGEX REPLACE "#include \"${module}/([A-Za-z]+\\.h)\"" "#include <movieconv/\\2>" text "${text}")
   string(REGEX REPLACE "([^A-Za-z/])${module}/([A-Za-z]+\\.h)" "\\1<movieconv/\\3>" text "${text}")
   string(REGEX MATCHALL "#include \"[^\"]+\"" left "${text}")

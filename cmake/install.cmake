@@ -55,10 +55,11 @@ install(FILES LICENSE DESTINATION ${doc_dir} RENAME copyright)
 install(DIRECTORY examples/ DESTINATION ${doc_dir}/examples)
 
 # find_package(MovieConv COMPONENTS convert)
-foreach(library IN ITEMS convert source text)
+foreach(library IN ITEMS convert sentence source text)
   set_target_properties(movieconv_${library} PROPERTIES EXPORT_NAME ${library})
 endforeach()
-install(TARGETS movieconv_convert movieconv_source movieconv_text EXPORT MovieConvHostTargets ARCHIVE DESTINATION ${home_dir})
+install(TARGETS movieconv_convert movieconv_sentence movieconv_source movieconv_text
+  EXPORT MovieConvHostTargets ARCHIVE DESTINATION ${home_dir})
 target_include_directories(movieconv_convert INTERFACE $<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}>)
 install(EXPORT MovieConvHostTargets NAMESPACE MovieConv:: DESTINATION ${package_dir})
 

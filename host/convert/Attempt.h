@@ -14,7 +14,7 @@ namespace movieconv {
 /// Of what a well-kept program does not throw. Without memory for the sentence it is a lack of memory.
 inline Failure Unexpected(const std::exception& error) noexcept {
     try {
-        return {Category::kInternal, error.what()};
+        return {Category::kInternal, WordsOf(error)};
     } catch (const std::bad_alloc&) {
         return {Category::kInternal, {}, Reason::kNoMemory};
     }

@@ -3,6 +3,7 @@
 #include "host/convert/CarryPlan.h"
 #include "host/convert/CarryTexts.h"
 #include "host/convert/Formats.h"
+#include "host/sentence/Say.h"
 #include "writer/WriterStatus.h"
 
 #include <fmt/format.h>
@@ -15,13 +16,13 @@ namespace {
 
 /// Hands a cover or an attachment that the format can hold to the writer; a cover after the first one, or of
 /// another kind, is a file among others. Empty when it was taken.
-std::string CarryStored(const Movie& movie, const StreamInfo& stream, const Request& request,
-                        const FileFormatInfo& format, uint32_t set, bool& hasCover) {
+Sentence CarryStored(const Movie& movie, const StreamInfo& stream, const Request& request,
+                     const FileFormatInfo& format, uint32_t set, bool& hasCover) {
     if (stream.kind != StreamKind::kCover && stream.kind != StreamKind::kAttachment)
         return {};
     const bool holdsFiles = Has(format, kWriterFormatAttachments);
     if (stream.kind == StreamKind::kCover && hasCover && !holdsFiles)
-        return "only one cover is carried";
+        return Say("only one cover is carried");
     const std::vector<uint8_t> data = movie.StoredFile(stream.index);
     const auto size = static_cast<int64_t>(data.size());
     const char* title = request.noMetadata ? "" : stream.title.c_str();
@@ -30,7 +31,7 @@ std::string CarryStored(const Movie& movie, const StreamInfo& stream, const Requ
         if (hasCover)
             MWDescribeCover(set, stream.fileName.c_str(), title);
         if (hasCover || !holdsFiles)
-            return hasCover ? "" : "it is neither JPEG nor PNG";
+            return hasCover ? Sentence() : Say("it is neither JPEG nor PNG");
     }
     const bool unnamed = stream.kind == StreamKind::kCover && stream.fileName.empty();
     const std::string type = stream.codec == "mjpeg" ? "jpeg" : stream.codec;
@@ -38,7 +39,7 @@ std::string CarryStored(const Movie& movie, const StreamInfo& stream, const Requ
     const std::string mimeType = unnamed ? fmt::format("image/{}", type) : stream.mimeType;
     const bool taken = MWAddAttachment(set, name.c_str(), mimeType.c_str(), data.data(), size) != 0 &&
                        MWDescribeAttachment(set, title) != 0;
-    return taken ? "" : "it has no name or no content";
+    return taken ? Sentence() : Say("it has no name or no content");
 }
 
 } // namespace
@@ -51,8 +52,7 @@ Carried CarryOver(Movie& movie, const Request& request, const FileFormatInfo& fo
     std::vector<NotCarried>& left = carried.left;
     if (!request.noChapters && !WhyChaptersStay(source, request, format))
         if (const int wrong = CarryChapters(source, request, format, writerSet); wrong != 0)
-            left.push_back(
-                {"chapters", std::nullopt, {}, {}, fmt::format("{} of them have no length", wrong)});
+            left.push_back({"chapters", std::nullopt, {}, {}, Say("{} of them have no length", wrong)});
     FurtherTracks tracks(movie, request, format, writerSet);
     for (const int number : plan.FurtherTracks())
         tracks.Add(source.streams[static_cast<std::size_t>(number)]);
@@ -64,10 +64,10 @@ Carried CarryOver(Movie& movie, const Request& request, const FileFormatInfo& fo
     for (const StreamInfo& stream : source.streams) {
         if (!plan.Wants(stream))
             continue;
-        std::string reason = plan.WhyItStays(stream);
-        if (reason.empty())
+        Sentence reason = plan.WhyItStays(stream);
+        if (reason.IsEmpty())
             reason = CarryStored(movie, stream, request, format, writerSet, hasCover);
-        if (!reason.empty())
+        if (!reason.IsEmpty())
             left.push_back(LeftOf(stream, std::move(reason)));
     }
     return carried;
@@ -77,9 +77,9 @@ std::vector<NotCarried> LostCues(const std::vector<SubtitleTrack>& subtitles, ui
     std::vector<NotCarried> lost;
     for (const auto& [track, stream] : subtitles)
         if (const int64_t count = MWGetLostCues(writerSet, track); count > 0)
-            lost.push_back(
-                LeftOf(stream, count == 1 ? "one of their texts could not be converted"
-                                          : fmt::format("{} of their texts could not be converted", count)));
+            lost.push_back(LeftOf(stream, count == 1
+                                              ? Say("one of their texts could not be converted")
+                                              : Say("{} of their texts could not be converted", count)));
     return lost;
 }
 

@@ -3,6 +3,7 @@
 #include "host/convert/CarryTexts.h"
 #include "host/convert/Formats.h"
 #include "host/convert/Timecode.h"
+#include "host/sentence/Say.h"
 #include "host/source/Languages.h"
 #include "host/source/StreamChoice.h"
 #include "media/FourCC.h"
@@ -12,7 +13,6 @@
 #include <algorithm>
 #include <cstddef>
 #include <cstdint>
-#include <fmt/format.h>
 #include <utility>
 
 namespace movieconv {
@@ -32,12 +32,16 @@ bool CanBeHeard(const StreamInfo& stream) {
     return stream.decodable && stream.sound && stream.sound->sampleRate > 0 && stream.sound->channels > 0;
 }
 
-std::string WhyCoverStays(const StreamInfo& cover, const FileFormatInfo& format) {
+Sentence CannotHoldIt(const FileFormatInfo& format) {
+    return Say("{} cannot hold it", ShortName(format));
+}
+
+Sentence WhyCoverStays(const StreamInfo& cover, const FileFormatInfo& format) {
     if (!Has(format, kWriterFormatCover))
-        return CannotHold(format, "it");
+        return CannotHoldIt(format);
     return format.fccFormat == FourCC("FLAC") && cover.bytes > kLargestCoverInFlac
-               ? fmt::format("{} cannot hold one of {} bytes", ShortName(format), cover.bytes)
-               : "";
+               ? Say("{} cannot hold one of {} bytes", ShortName(format), cover.bytes)
+               : Sentence();
 }
 
 /// Without what is drawn into the pictures, unless it is asked for by name.
@@ -73,7 +77,7 @@ CarryPlan::CarryPlan(const SourceInfo& source, const Request& request, const Fil
     for (const int stream : FurtherSound())
         further_.push_back(stream);
     for (const int stream : subtitles_)
-        if (WhySubtitlesStay(StreamAt(source, stream), format).empty())
+        if (WhySubtitlesStay(StreamAt(source, stream), format).IsEmpty())
             further_.push_back(stream);
 }
 
@@ -81,7 +85,7 @@ std::vector<int> CarryPlan::FurtherSound() const {
     std::vector<int> further;
     for (const int number : sounds_)
         if (source_.sound && number != source_.sound->index &&
-            WhySoundStays(StreamAt(source_, number)).empty())
+            WhySoundStays(StreamAt(source_, number)).IsEmpty())
             further.push_back(number);
     return further;
 }
@@ -93,41 +97,42 @@ bool CarryPlan::Wants(const StreamInfo& stream) const {
                                                    : true;
 }
 
-std::string CarryPlan::WhyItStays(const StreamInfo& stream) const {
+Sentence CarryPlan::WhyItStays(const StreamInfo& stream) const {
     switch (stream.kind) {
     case StreamKind::kPictures:
         if (format_.bHasVideo == 0 || (source_.pictures && source_.pictures->index == stream.index))
             return {};
-        return source_.pictures ? "one stream of pictures is converted" : "it cannot be decoded";
+        return source_.pictures ? Say("one stream of pictures is converted") : Say("it cannot be decoded");
     case StreamKind::kSound: {
         const bool isConverted = source_.sound ? source_.sound->index == stream.index : CanBeHeard(stream);
-        return format_.bHasAudio != 0 && isConverted ? "" : WhySoundStays(stream);
+        return format_.bHasAudio != 0 && isConverted ? Sentence() : WhySoundStays(stream);
     }
     case StreamKind::kSubtitles:
         return WhySubtitlesStay(stream, format_);
     case StreamKind::kData:
-        return stream.holdsChapters || HoldsTheTimecode(source_, stream) ? ""
-                                                                         : "data streams are not converted";
+        return stream.holdsChapters || HoldsTheTimecode(source_, stream)
+                   ? Sentence()
+                   : Say("data streams are not converted");
     case StreamKind::kCover:
         return WhyCoverStays(stream, format_);
     case StreamKind::kAttachment:
-        return Has(format_, kWriterFormatAttachments) ? "" : CannotHold(format_, "it");
+        return Has(format_, kWriterFormatAttachments) ? Sentence() : CannotHoldIt(format_);
     }
     return {};
 }
 
 /// Why a stream of sound beside the engine's stays behind; empty when it does not.
-std::string CarryPlan::WhySoundStays(const StreamInfo& stream) const {
+Sentence CarryPlan::WhySoundStays(const StreamInfo& stream) const {
     if (format_.bHasAudio == 0)
-        return CannotHold(format_, "it");
+        return CannotHoldIt(format_);
     if (!Has(format_, kWriterFormatTracks))
-        return fmt::format("{} holds one track of sound, MKV and MP4 hold several", ShortName(format_));
+        return Say("{} holds one track of sound, MKV and MP4 hold several", ShortName(format_));
     if (!CanBeHeard(stream))
-        return "it cannot be decoded";
+        return Say("it cannot be decoded");
     if (request_.copySound && MWCarriesPackets(format_.fccFormat, stream.codec.c_str()) == 0)
-        return CannotHold(format_, "it as it is");
+        return Say("{} cannot hold it as it is", ShortName(format_));
     if (source_.pictures && !BelongsTo(StreamAt(source_, source_.pictures->index).programs, stream))
-        return "it belongs to another programme";
+        return Say("it belongs to another programme");
     return {};
 }
 
@@ -135,19 +140,19 @@ std::string CarryPlan::WhySoundStays(const StreamInfo& stream) const {
 void CarryPlan::AddLostChapters(std::vector<NotCarried>& left) const {
     if (request_.noChapters)
         return;
-    const auto tell = [&](std::string reason) {
+    const auto tell = [&](Sentence reason) {
         left.push_back({"chapters", std::nullopt, {}, {}, std::move(reason)});
     };
-    const auto add = [&](int count, const char* what) {
-        if (count > 0)
-            tell(fmt::format("{} of them {}", count, what));
-    };
-    add(source_.unreadChapters, "are in other editions or within others");
-    add(source_.disorderedChapters, "are out of their order in time");
-    add(ChaptersOutside(source_), "lie outside the movie");
-    add(source_.furtherTitles, "have titles in further languages");
-    if (std::string names = FurtherChapterTexts(source_); !names.empty() && !request_.noMetadata)
-        tell(fmt::format("of their texts only the titles are carried, not {}", names));
+    if (const int count = source_.unreadChapters; count > 0)
+        tell(Say("{} of them are in other editions or within others", count));
+    if (const int count = source_.disorderedChapters; count > 0)
+        tell(Say("{} of them are out of their order in time", count));
+    if (const int count = ChaptersOutside(source_); count > 0)
+        tell(Say("{} of them lie outside the movie", count));
+    if (const int count = source_.furtherTitles; count > 0)
+        tell(Say("{} of them have titles in further languages", count));
+    if (const Sentence names = FurtherChapterTexts(source_); !names.IsEmpty() && !request_.noMetadata)
+        tell(Say("of their texts only the titles are carried, not {}", names));
 }
 
 /// Of the one cover that is carried.
@@ -162,7 +167,7 @@ std::optional<NotCarried> CarryPlan::LostCoverTitle() const {
                       cover->index,
                       cover->codec,
                       {},
-                      fmt::format("{} cannot hold its {}", ShortName(format_), "title")};
+                      Say("{} cannot hold its {}", ShortName(format_), Say("title"))};
 }
 
 std::vector<NotCarried> CarryPlan::LostByFormat() const {
@@ -183,20 +188,21 @@ std::vector<NotCarried> CarryPlan::LostByFormat() const {
 
 std::optional<NotCarried> LostOfFile(const StreamInfo& stream, const Request& request,
                                      const FileFormatInfo& format) {
-    if (std::string reason = WhySubtitlesStay(stream, format); !reason.empty())
+    if (Sentence reason = WhySubtitlesStay(stream, format); !reason.IsEmpty())
         return NotCarried{"subtitles", std::nullopt, stream.codec, stream.language, std::move(reason)};
     return LostLabel(stream, request, format);
 }
 
-std::string WhySubtitlesStay(const StreamInfo& stream, const FileFormatInfo& format) {
+Sentence WhySubtitlesStay(const StreamInfo& stream, const FileFormatInfo& format) {
     constexpr uint32_t kMatroska = FourCC("MKV ");
     if (MWCarriesPackets(format.fccFormat, stream.codec.c_str()) != 0)
         return {};
     const bool matroskaCan = MWCarriesPackets(kMatroska, stream.codec.c_str()) != 0;
-    return CannotHold(format, matroskaCan ? "them, MKV can" : "them");
+    return matroskaCan ? Say("{} cannot hold them, MKV can", ShortName(format))
+                       : Say("{} cannot hold them", ShortName(format));
 }
 
-NotCarried LeftOf(const StreamInfo& stream, std::string reason) {
+NotCarried LeftOf(const StreamInfo& stream, Sentence reason) {
     const std::string& what = stream.codec == "none" ? stream.fileName : stream.codec;
     const auto number = stream.index >= 0 ? std::optional(stream.index) : std::nullopt; // none: a file's own
     return {std::string(KindName(stream.kind)), number, what, stream.language, std::move(reason)};
@@ -216,7 +222,7 @@ std::vector<NotCarried> ForetellLeftBehind(const SourceInfo& source, const Reque
     }
     for (const StreamInfo& stream : source.streams)
         if (plan.Wants(stream))
-            if (std::string reason = plan.WhyItStays(stream); !reason.empty())
+            if (Sentence reason = plan.WhyItStays(stream); !reason.IsEmpty())
                 left.push_back(LeftOf(stream, std::move(reason)));
     return left;
 }

@@ -31,13 +31,13 @@ public:
 
     /// Why a wanted stream stays behind. Empty when the format can hold it, or it is of a kind of which the
     /// source itself tells.
-    std::string WhyItStays(const StreamInfo& stream) const;
+    Sentence WhyItStays(const StreamInfo& stream) const;
 
     /// Texts, labels and chapters that the format has no room for.
     std::vector<NotCarried> LostByFormat() const;
 
 private:
-    std::string WhySoundStays(const StreamInfo& stream) const;
+    Sentence WhySoundStays(const StreamInfo& stream) const;
     void AddLostChapters(std::vector<NotCarried>& left) const;
     std::optional<NotCarried> LostCoverTitle() const;
 
@@ -54,10 +54,10 @@ std::optional<NotCarried> LostOfFile(const StreamInfo& stream, const Request& re
                                      const FileFormatInfo& format);
 
 /// Why subtitles stay behind; empty when they do not.
-std::string WhySubtitlesStay(const StreamInfo& stream, const FileFormatInfo& format);
+Sentence WhySubtitlesStay(const StreamInfo& stream, const FileFormatInfo& format);
 
 /// The report of a stream that stays behind, or is changed, for `reason`.
-NotCarried LeftOf(const StreamInfo& stream, std::string reason);
+NotCarried LeftOf(const StreamInfo& stream, Sentence reason);
 
 /// What CarryOver is going to leave behind of a source as AsAskedFor gives it. Opens no file: covers and
 /// chapters that turn out to be of no use are not among it.

@@ -2,6 +2,7 @@
 
 #include "host/convert/Formats.h"
 #include "host/convert/Timecode.h"
+#include "host/sentence/Say.h"
 #include "host/source/Languages.h"
 #include "host/source/MediaTime.h"
 #include "media/MediaRecords.h"
@@ -30,14 +31,6 @@ int Dispositions(const StreamFlags& flags) {
            (flags.commentary ? AV_DISPOSITION_COMMENT : 0) |
            (flags.hearingImpaired ? AV_DISPOSITION_HEARING_IMPAIRED : 0) |
            (flags.visualImpaired ? AV_DISPOSITION_VISUAL_IMPAIRED : 0);
-}
-
-/// "a", "a and b", "a, b and c".
-std::string Enumerate(const std::vector<std::string>& names) {
-    std::string text;
-    for (std::size_t i = 0; i < names.size(); ++i)
-        text += (i == 0 ? "" : i + 1 == names.size() ? " and " : ", ") + names[i];
-    return text;
 }
 
 /// The texts of the output: the source's, where the request has no others. A timecode is none of them.
@@ -152,25 +145,26 @@ void LabelTrack(const StreamInfo& stream, const Request& request, const FileForm
 
 std::optional<NotCarried> LostLabel(const StreamInfo& stream, const Request& request,
                                     const FileFormatInfo& format) {
-    std::vector<std::string> missing;
+    std::vector<Sentence> missing;
     if (!stream.language.empty() && LanguageIn(format, stream).empty())
-        missing.emplace_back("language");
+        missing.push_back(Say("language"));
     else if (!stream.languageTag.empty() &&
              MWCarriesTrackTag(format.fccFormat, "language_tag", stream.languageTag.c_str()) == 0)
-        missing.push_back(fmt::format("language as {}", stream.languageTag));
+        missing.push_back(Say("language as {}", stream.languageTag));
     if (!request.noMetadata && !stream.title.empty() &&
         MWCarriesTrackTag(format.fccFormat, "title", stream.title.c_str()) == 0)
-        missing.emplace_back("title");
+        missing.push_back(Say("title"));
     const int carried = MWCarriedTrackFlags(format.fccFormat) | AV_DISPOSITION_DEFAULT;
     if ((Dispositions(stream.flags) & ~carried) != 0)
-        missing.emplace_back("flags");
+        missing.push_back(Say("flags"));
     for (const Tag& tag : TextsOf(stream, request))
         if (MWCarriesTrackTag(format.fccFormat, tag.key.c_str(), tag.value.c_str()) == 0)
-            missing.push_back(tag.key);
+            missing.emplace_back(tag.key);
     if (missing.empty())
         return std::nullopt;
     return NotCarried{"label", stream.index >= 0 ? std::optional(stream.index) : std::nullopt, stream.codec,
-                      stream.language, CannotHold(format, "its " + Enumerate(missing))};
+                      stream.language,
+                      Say("{} cannot hold its {}", ShortName(format), SayList(std::move(missing)))};
 }
 
 void CarryTexts(const SourceInfo& source, const Request& request, const FileFormatInfo& format,
@@ -184,12 +178,16 @@ void CarryTexts(const SourceInfo& source, const Request& request, const FileForm
 std::vector<NotCarried> LostTexts(const SourceInfo& source, const Request& request,
                                   const FileFormatInfo& format) {
     std::vector<NotCarried> left;
-    std::vector<std::string> missing;
+    std::vector<Sentence> missing;
     for (const Tag& tag : TextsFor(source, request))
         if (!tag.value.empty() && MWCarriesTag(format.fccFormat, tag.key.c_str(), tag.value.c_str()) == 0)
-            missing.push_back(tag.key);
+            missing.emplace_back(tag.key);
     if (!missing.empty())
-        left.push_back({"tags", std::nullopt, {}, {}, CannotHold(format, Enumerate(missing))});
+        left.push_back({"tags",
+                        std::nullopt,
+                        {},
+                        {},
+                        Say("{} cannot hold {}", ShortName(format), SayList(std::move(missing)))});
     for (const auto& [stream, track] : EnginesTracks(source, request, format))
         if (std::optional<NotCarried> lost = LostLabel(*stream, request, format))
             left.push_back(std::move(*lost));
@@ -210,13 +208,13 @@ int ChaptersOutside(const SourceInfo& source) {
         }));
 }
 
-std::string FurtherChapterTexts(const SourceInfo& source) {
-    std::vector<std::string> names;
+Sentence FurtherChapterTexts(const SourceInfo& source) {
+    std::vector<Sentence> names;
     for (const Chapter& chapter : source.chapters)
         for (const Tag& tag : chapter.tags)
-            if (std::find(names.begin(), names.end(), tag.key) == names.end())
-                names.push_back(tag.key);
-    return Enumerate(names);
+            if (std::find(names.begin(), names.end(), Sentence(tag.key)) == names.end())
+                names.emplace_back(tag.key);
+    return SayList(std::move(names));
 }
 
 std::optional<NotCarried> WhyChaptersStay(const SourceInfo& source, const Request& request,
@@ -224,7 +222,7 @@ std::optional<NotCarried> WhyChaptersStay(const SourceInfo& source, const Reques
     if (Has(format, kWriterFormatChapters | kWriterFormatChapterTexts) || source.chapters.empty() ||
         request.noChapters)
         return std::nullopt;
-    return NotCarried{"chapters", std::nullopt, {}, {}, CannotHold(format, "them")};
+    return NotCarried{"chapters", std::nullopt, {}, {}, Say("{} cannot hold them", ShortName(format))};
 }
 
 } // namespace movieconv

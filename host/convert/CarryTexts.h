@@ -39,7 +39,7 @@ int CarryChapters(const SourceInfo& source, const Request& request, const FileFo
 int ChaptersOutside(const SourceInfo& source);
 
 /// What is said of chapters beside their titles: "artist and comment"; empty when nothing is.
-std::string FurtherChapterTexts(const SourceInfo& source);
+Sentence FurtherChapterTexts(const SourceInfo& source);
 
 /// Nothing when there are none, none are wanted, or the format holds them.
 std::optional<NotCarried> WhyChaptersStay(const SourceInfo& source, const Request& request,

@@ -2,13 +2,13 @@
 
 #include "host/convert/Failure.h"
 #include "host/convert/Formats.h"
+#include "host/sentence/Say.h"
 #include "media/FourCC.h"
 #include "media/Limits.h"
 #include "writer/WriterStatus.h"
 
 #include <algorithm>
 #include <cmath>
-#include <fmt/format.h>
 #include <string>
 #include <vector>
 
@@ -37,8 +37,8 @@ uint32_t ChooseCodec(const std::optional<uint32_t>& asked, const std::vector<uin
     if (isOpen)
         return forSound ? format.fccAudioCodecs[0] : format.fccVideoCodecs[0];
     throw Failure(Category::kRequest,
-                  fmt::format("{} cannot carry {} as \"{}\"", format.szName, forSound ? "sound" : "pictures",
-                              NamesOf(wanted)),
+                  forSound ? Say("{} cannot carry sound as \"{}\"", format.szName, NamesOf(wanted))
+                           : Say("{} cannot carry pictures as \"{}\"", format.szName, NamesOf(wanted)),
                   Reason::kCodec);
 }
 
@@ -76,12 +76,11 @@ void RequireQuality(uint32_t codec, double quality) {
     const std::optional<QualityScale> scale = QualityScaleOf(codec);
     if (!scale) {
         throw Failure(Category::kRequest,
-                      fmt::format("\"{}\" has no constant quality; give it a bit rate", CodeName(codec)));
+                      Say("\"{}\" has no constant quality; give it a bit rate", CodeName(codec)));
     }
     if (!(quality >= scale->best && quality <= scale->worst)) { // nor what is no number
-        throw Failure(Category::kRequest,
-                      fmt::format("the quality of \"{}\" goes from {} (best) to {}, not to {}",
-                                  CodeName(codec), scale->best, scale->worst, quality));
+        throw Failure(Category::kRequest, Say("the quality of \"{}\" goes from {} (best) to {}, not to {}",
+                                              CodeName(codec), scale->best, scale->worst, quality));
     }
 }
 
@@ -105,12 +104,12 @@ void PlanDepth(PicturePlan& plan, const Request& request, const FileFormatInfo& 
     const int most = MostDepth(request, format);
     if (request.depth && *request.depth > most) {
         throw Failure(Category::kRequest,
-                      fmt::format("\"{}\" has pictures of {} bits; HEVC, VP90 and AV01 have some of 10",
-                                  CodeName(plan.codec), most));
+                      Say("\"{}\" has pictures of {} bits; HEVC, VP90 and AV01 have some of 10",
+                          CodeName(plan.codec), most));
     }
     if (request.hdr == Hdr::kKeep && IsHdr(source) && most <= 8) {
         throw Failure(Category::kRequest,
-                      fmt::format("HDR needs pictures of 10 bits; \"{}\" has 8 here", CodeName(plan.codec)));
+                      Say("HDR needs pictures of 10 bits; \"{}\" has 8 here", CodeName(plan.codec)));
     }
     plan.keepsHdr = IsHdr(source) && most > 8 && request.hdr != Hdr::kSdr;
     plan.depth = request.depth.value_or(source.depth > 8 || plan.keepsHdr ? most : 8);

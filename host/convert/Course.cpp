@@ -9,6 +9,7 @@
 #include "host/convert/SoundLoss.h"
 #include "host/convert/Sources.h"
 #include "host/convert/Timecode.h"
+#include "host/sentence/Say.h"
 #include "host/source/MediaTime.h"
 #include "text/FileNames.h"
 #include "text/Utf8.h"
@@ -18,7 +19,6 @@
 #include <chrono>
 #include <cmath>
 #include <cstring>
-#include <fmt/format.h>
 #include <limits>
 #include <string_view>
 #include <utility>
@@ -109,9 +109,9 @@ void Course::RunEngine(double begin, double length) {
     position_ = 0;
     outcome_ = kNone;
     if (MCStart(engine_.get(), begin, length, nullptr, OnProgress, this) != 0)
-        throw Failure(Category::kInternal, "the conversion could not be started");
+        throw Failure(Category::kInternal, Say("the conversion could not be started"));
     if (MCWait(engine_.get(), 0) == 0 && outcome_ == kNone)
-        throw Failure(Category::kInternal, "no thread could be started for the conversion");
+        throw Failure(Category::kInternal, Say("no thread could be started for the conversion"));
     try {
         WaitForEnd();
     } catch (...) {
@@ -189,8 +189,8 @@ void Course::LookAfterFile() {
         outcome_ == kNone && !brokenOff_ ? watch_.VanishedFile() : std::nullopt;
     if (!vanished)
         return;
-    brokenOff_.emplace(Category::kOutput, fmt::format("\"{}\" vanished while it was written: {}", *vanished,
-                                                      std::strerror(ENOENT)));
+    brokenOff_.emplace(Category::kOutput,
+                       Say("\"{}\" vanished while it was written: {}", *vanished, std::strerror(ENOENT)));
     Stop();
 }
 
@@ -313,10 +313,10 @@ Verdict Course::Conclude() {
     ReportComplaints();
     for (const NotCarried& lost : LostCues(subtitles_, watch_.OptionSet()))
         observer_.LeftBehind(lost);
-    const std::string shortfall =
+    const Sentence shortfall =
         outcome_ == kOutcomeCompleted
             ? WhyItEndedEarly(movie_, request_, std::max(Position(), movie_.SoundSeconds()))
-            : std::string();
+            : Sentence();
     Verdict verdict;
     verdict.failure = FindFailure({request_, files_, brokenOff_, movie_.ReadError(), shortfall, userStopped_,
                                    outcome_, request_.begin + Position()});
@@ -338,13 +338,13 @@ Verdict Course::Conclude() {
 void Course::ReportComplaints() {
     EncodeParam param{};
     MCGetEncodeParam(engine_.get(), &param);
-    std::vector<std::string> complaints = TellSoundLoss(movie_.Info(), request_, param);
-    if (std::string loss = TellRateLoss(request_, movie_.Info()); !loss.empty())
+    std::vector<Sentence> complaints = TellSoundLoss(movie_.Info(), request_, param);
+    if (Sentence loss = TellRateLoss(request_, movie_.Info()); !loss.IsEmpty())
         complaints.push_back(std::move(loss));
-    for (std::string& complaint : movie_.Complaints())
+    for (Sentence& complaint : movie_.Complaints())
         complaints.push_back(std::move(complaint));
-    for (const std::string& complaint : complaints)
-        observer_.Warned({Warning::Kind::kSource, fmt::format("\"{}\": {}", request_.input, complaint)});
+    for (const Sentence& complaint : complaints)
+        observer_.Warned({Warning::Kind::kSource, Say("\"{}\": {}", request_.input, complaint)});
 }
 
 } // namespace movieconv

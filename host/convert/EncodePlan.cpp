@@ -3,6 +3,7 @@
 #include "host/convert/CodecPlan.h"
 #include "host/convert/Failure.h"
 #include "host/convert/Formats.h"
+#include "host/sentence/Say.h"
 #include "media/Limits.h"
 #include "media/MediaWriter.h"
 #include "writer/WriterStatus.h"
@@ -10,7 +11,6 @@
 #include <algorithm>
 #include <cstdint>
 #include <filesystem>
-#include <fmt/format.h>
 
 namespace movieconv {
 namespace {
@@ -55,15 +55,17 @@ void RequireCopyable(const FileFormatInfo& format, const Request& request, const
         for (const FileFormatInfo* other = MWGetFileFormatInfos(); other->fccFormat != 0; ++other)
             if (MWCarriesPackets(other->fccFormat, sound.codec.c_str()) != 0)
                 others += (others.empty() ? "" : ", ") + CodeName(other->fccFormat);
-        throw Failure(Category::kRequest,
-                      fmt::format("{} cannot hold \"{}\" sound as it is; {}", name, sound.codec,
-                                  others.empty() ? "no format can" : others + " can"));
+        throw Failure(
+            Category::kRequest,
+            others.empty()
+                ? Say("{} cannot hold \"{}\" sound as it is; no format can", name, SayCodec(sound.codec))
+                : Say("{} cannot hold \"{}\" sound as it is; {} can", name, SayCodec(sound.codec), others));
     }
     const double late = sound.begin.value_or(0) - request.begin;
     if (withPictures && late > kLate && Has(format, kWriterFormatSteadyRate))
-        throw Failure(Category::kRequest,
-                      fmt::format("{} cannot begin the sound as it is {:.1f} s behind the pictures; MKV can",
-                                  name, late));
+        throw Failure(
+            Category::kRequest,
+            Say("{} cannot begin the sound as it is {:.1f} s behind the pictures; MKV can", name, late));
 }
 
 } // namespace
@@ -75,13 +77,11 @@ const FileFormatInfo& ChooseFormat(const Request& request) {
     if (namesNone && request.preferences.format)
         format = FindFormat(CodeName(*request.preferences.format));
     if (format == nullptr && request.format) {
-        throw Failure(Category::kRequest,
-                      fmt::format("there is no file format \"{}\"", CodeName(*request.format)),
+        throw Failure(Category::kRequest, Say("there is no file format \"{}\"", CodeName(*request.format)),
                       Reason::kCodec);
     }
     if (format == nullptr) {
-        throw Failure(Category::kRequest,
-                      fmt::format("the extension of \"{}\" tells no file format", request.output),
+        throw Failure(Category::kRequest, Say("the extension of \"{}\" tells no file format", request.output),
                       Reason::kNoFormat);
     }
     PictureCodecFor(request, *format);
@@ -100,9 +100,8 @@ EncodeParam PlanEncoding(const EncodeParam& defaults, const FileFormatInfo& form
     if (param.bNoAudio == 0)
         PutSound(param, format, request, *source.sound);
     if (param.bNoVideo != 0 && param.bNoAudio != 0) {
-        throw Failure(Category::kRequest,
-                      fmt::format("{} carries nothing that \"{}\" holds; choose another format",
-                                  format.szName, source.path));
+        throw Failure(Category::kRequest, Say("{} carries nothing that \"{}\" holds; choose another format",
+                                              format.szName, source.path));
     }
     if (request.copySound && param.bNoAudio == 0) {
         const StreamInfo& sound = source.streams[static_cast<std::size_t>(source.sound->index)];
@@ -111,24 +110,22 @@ EncodeParam PlanEncoding(const EncodeParam& defaults, const FileFormatInfo& form
     return param;
 }
 
-std::string TellRateLoss(const Request& request, const SourceInfo& source) {
+Sentence TellRateLoss(const Request& request, const SourceInfo& source) {
     const FileFormatInfo& format = ChooseFormat(request);
     if (!source.pictures || format.bHasVideo == 0 || !Has(format, kWriterFormatSteadyRate) ||
         source.pictures->frameRate <= kHighestFrameRate ||
         PlanPictures(request, format, *source.pictures).frameRate)
         return {};
-    return fmt::format("its {:.0f} pictures a second got {:.0f}", source.pictures->frameRate,
-                       kHighestFrameRate);
+    return Say("its {:.0f} pictures a second got {:.0f}", source.pictures->frameRate, kHighestFrameRate);
 }
 
 double LengthToConvert(const Request& request, const SourceInfo& source) {
     const double rest = source.duration - request.begin;
     if (rest <= 0 && source.certainty == Certainty::kKnown) {
-        throw Failure(
-            Category::kRequest,
-            fmt::format("the begin, {:.3f} s, is not before the end of \"{}\", which is {:.3f} s long",
-                        request.begin, source.path, source.duration),
-            Reason::kBeginTooLate);
+        throw Failure(Category::kRequest,
+                      Say("the begin, {:.3f} s, is not before the end of \"{}\", which is {:.3f} s long",
+                          request.begin, source.path, source.duration),
+                      Reason::kBeginTooLate);
     }
     if (!request.length)
         return std::max(rest, 0.0);

@@ -19,7 +19,7 @@ EncodeParam PlanEncoding(const EncodeParam& defaults, const FileFormatInfo& form
 
 /// What becomes of a source with more pictures a second than the engine gives a format that needs a steady
 /// rate, a sentence; empty where every picture has its own time, or another rate was asked for.
-std::string TellRateLoss(const Request& request, const SourceInfo& source);
+Sentence TellRateLoss(const Request& request, const SourceInfo& source);
 
 /// Seconds of the source that the request asks for. Throws Failure when they begin behind its end.
 double LengthToConvert(const Request& request, const SourceInfo& source);

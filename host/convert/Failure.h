@@ -2,8 +2,8 @@
 #ifndef MOVIECONV_HOST_CONVERT_FAILURE_H
 #define MOVIECONV_HOST_CONVERT_FAILURE_H
 
-#include <exception>
-#include <string>
+#include "host/sentence/SentenceError.h"
+
 #include <utility>
 
 namespace movieconv {
@@ -29,24 +29,22 @@ enum class Reason {
     kLeftover,      ///< What an earlier run left would be lost, and the request does not allow that.
     kCannotResume,  ///< What is left of an earlier run is of another conversion.
     kUnknownLength, ///< The source tells no length, and the request neither.
+    kNoPreset,      ///< There is no preset of that name.
 };
 
 /// A failure that ends a conversion or keeps it from beginning: what, where and what to do.
-class Failure : public std::exception {
+class Failure : public SentenceError {
 public:
     // cppcheck-suppress passedByValue ; moved, since copying could throw
-    Failure(Category category, std::string text, Reason reason = Reason::kOther) noexcept
-        : category_(category), reason_(reason), text_(std::move(text)) {}
+    Failure(Category category, Sentence words, Reason reason = Reason::kOther) noexcept
+        : SentenceError(std::move(words)), category_(category), reason_(reason) {}
 
-    const char* what() const noexcept override { return text_.c_str(); }
-    const std::string& Text() const { return text_; } ///< A sentence without a full stop.
     Category Kind() const { return category_; }
     Reason Why() const { return reason_; }
 
 private:
     Category category_;
     Reason reason_;
-    std::string text_;
 };
 
 } // namespace movieconv

@@ -2,12 +2,12 @@
 
 #include "host/convert/Amounts.h"
 #include "host/convert/Room.h"
+#include "host/convert/WritersWords.h"
+#include "host/sentence/Say.h"
 #include "text/Path.h"
 
 #include <algorithm>
 #include <cmath>
-#include <cstring>
-#include <fmt/format.h>
 
 namespace movieconv {
 namespace {
@@ -34,37 +34,36 @@ Reason ReasonOf(int error) {
 }
 
 /// What went wrong, where, and what remains.
-std::string TextOf(const WriterStatus& failure) {
-    std::string text =
-        fmt::format("cannot write \"{}\": {}", failure.szPath,
-                    failure.szWhat[0] != '\0' ? failure.szWhat : "the media writer gave no reason");
-    if (text.back() == '.') // the writer's sentence goes on below
-        text.pop_back();
-    if (failure.nSystemError != 0 &&
-        std::strstr(failure.szWhat, std::strerror(failure.nSystemError)) == nullptr)
-        text += fmt::format(" ({})", std::strerror(failure.nSystemError));
+Sentence TellFailure(const WriterStatus& failure) {
+    Sentence what = WritersWords(failure);
     if (failure.nError == kWriterErrorNoSpace) {
         const int64_t free = FreeBytes(text::FolderOf(failure.szPath));
-        text += fmt::format("; {} were written, {} are free: make room or choose another disk",
-                            FormatBytes(failure.llBytesWritten), FormatBytes(free > 0 ? free : 0));
+        what =
+            Say("{}; {} were written, {} are free: make room or choose another disk", what,
+                SayAmount(FormatBytes(failure.llBytesWritten)), SayAmount(FormatBytes(free > 0 ? free : 0)));
     }
-    if (failure.szTemporaryPath[0] != '\0')
-        text += fmt::format("; what was written so far is in \"{}\"", failure.szTemporaryPath);
-    return text;
+    const std::string path = failure.szPath;
+    const std::string left = failure.szTemporaryPath;
+    return left.empty()
+               ? Say("cannot write \"{}\": {}", path, what)
+               : Say("cannot write \"{}\": {}; what was written so far is in \"{}\"", path, what, left);
 }
 
 /// Compares a complete file with what was sent into it. Empty when everything is there.
-std::string MissingFrom(const WriterStatus& file) {
-    const auto compare = [&](const char* what, double written, double received, double frame) {
-        if (std::abs(written - received) <= std::max(kLengthTolerance, frame))
-            return std::string();
-        return fmt::format("\"{}\" holds {:.3f} s of {}, but {:.3f} s were sent into it", file.szPath,
-                           written, what, received);
+Sentence MissingFrom(const WriterStatus& file) {
+    const auto lacks = [](double written, double received, double frame) {
+        return std::abs(written - received) > std::max(kLengthTolerance, frame);
     };
-    const std::string pictures =
-        compare("pictures", file.dVideoWritten, file.dVideoReceived,
-                file.dVideoWritten / static_cast<double>(std::max<int64_t>(1, file.llPicturesWritten)));
-    return pictures.empty() ? compare("sound", file.dAudioWritten, file.dAudioReceived, 0.0) : pictures;
+    const std::string path = file.szPath;
+    const double picture =
+        file.dVideoWritten / static_cast<double>(std::max<int64_t>(1, file.llPicturesWritten));
+    if (lacks(file.dVideoWritten, file.dVideoReceived, picture))
+        return Say("\"{}\" holds {:.3f} s of pictures, but {:.3f} s were sent into it", path,
+                   double{file.dVideoWritten}, double{file.dVideoReceived});
+    if (lacks(file.dAudioWritten, file.dAudioReceived, 0))
+        return Say("\"{}\" holds {:.3f} s of sound, but {:.3f} s were sent into it", path,
+                   double{file.dAudioWritten}, double{file.dAudioReceived});
+    return {};
 }
 
 } // namespace
@@ -88,24 +87,24 @@ bool FileLedger::Enter(const WriterWatch::News& news) {
         break;
     }
     if (news.status.nError != kWriterErrorNone && !failure_) {
-        failure_.emplace(CategoryOf(news.status.nError), TextOf(news.status), ReasonOf(news.status.nError));
+        failure_.emplace(CategoryOf(news.status.nError), TellFailure(news.status),
+                         ReasonOf(news.status.nError));
         failed_ = news.status.szPath;
     }
     // What remains of the file is known now.
     if (news.event == kWriterEventClosed && !failed_.empty() && failed_ == news.status.szPath)
-        failure_.emplace(failure_->Kind(), TextOf(news.status), failure_->Why());
+        failure_.emplace(failure_->Kind(), TellFailure(news.status), failure_->Why());
     return !(wasWell && failure_);
 }
 
-std::optional<std::string> FileLedger::FindMissing() const {
+std::optional<Sentence> FileLedger::FindMissing() const {
     for (const Entry& entry : complete_) {
         const FileIdentity now = IdentityOf(entry.path);
         if (entry.identity.exists && now == entry.identity)
             continue;
         if (!now.exists)
-            return fmt::format("\"{}\" was written but stands there no more: it vanished meanwhile",
-                               entry.path);
-        return fmt::format("\"{}\" was written, but another file stands there now", entry.path);
+            return Say("\"{}\" was written but stands there no more: it vanished meanwhile", entry.path);
+        return Say("\"{}\" was written, but another file stands there now", entry.path);
     }
     return std::nullopt;
 }
@@ -116,14 +115,13 @@ void FileLedger::EnterClosed(const WriterWatch::News& news) {
         return;
     complete_.push_back({file.szPath, news.identity});
     if (news.identity.exists && news.identity.size != file.llBytesWritten && !failure_) {
-        failure_.emplace(Category::kOutput,
-                         fmt::format("\"{}\" has {} bytes, but {} were written into it", file.szPath,
-                                     news.identity.size, file.llBytesWritten));
+        failure_.emplace(Category::kOutput, Say("\"{}\" has {} bytes, but {} were written into it",
+                                                file.szPath, news.identity.size, file.llBytesWritten));
     }
     bytes_ += file.llBytesWritten;
     observer_.Closed({opened_, file.szPath, file.dVideoWritten, file.dAudioWritten, file.llBytesWritten,
                       file.llPicturesReceived});
-    if (const std::string missing = MissingFrom(file); !missing.empty() && !failure_)
+    if (const Sentence missing = MissingFrom(file); !missing.IsEmpty() && !failure_)
         failure_.emplace(Category::kInternal, missing);
 }
 

@@ -31,7 +31,7 @@ public:
     std::optional<double> Finishing() const { return finishing_; }
 
     /// Why not everything that was closed stands under its name, a sentence; nothing when it does.
-    std::optional<std::string> FindMissing() const;
+    std::optional<Sentence> FindMissing() const;
 
     /// What went wrong first; nothing when all is well.
     const std::optional<Failure>& FirstFailure() const { return failure_; }

@@ -7,7 +7,6 @@
 
 #include <algorithm>
 #include <cctype>
-#include <fmt/format.h>
 
 namespace movieconv {
 namespace {
@@ -66,10 +65,6 @@ const FileFormatInfo* FindFormatOfFile(std::string_view path) {
 
 bool Has(const FileFormatInfo& format, uint32_t trait) {
     return (MWGetFormatTraits(format.fccFormat) & trait) != 0;
-}
-
-std::string CannotHold(const FileFormatInfo& format, std::string_view what) {
-    return fmt::format("{} cannot hold {}", ShortName(format), what);
 }
 
 std::optional<uint32_t> ParseCode(std::string_view text) {

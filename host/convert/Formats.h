@@ -23,9 +23,6 @@ std::string ShortName(const FileFormatInfo& format);
 /// Whether the format has one of the media writer's kWriterFormat...
 bool Has(const FileFormatInfo& format, uint32_t trait);
 
-/// "MP4 cannot hold it"
-std::string CannotHold(const FileFormatInfo& format, std::string_view what);
-
 /// Compares by bytes, ASCII letters in any case.
 bool SameIgnoringCase(std::string_view one, std::string_view other);
 

@@ -5,12 +5,12 @@
 #include "host/convert/CodecPlan.h"
 #include "host/convert/Failure.h"
 #include "host/convert/Formats.h"
+#include "host/sentence/Say.h"
 #include "host/source/Languages.h"
 #include "host/source/MediaTime.h"
 #include "host/source/SourceError.h"
 #include "media/MediaRecords.h"
 
-#include <fmt/format.h>
 #include <new>
 
 namespace movieconv {
@@ -29,9 +29,8 @@ void RequireHoldable(const AVCodecParameters& sound, const FileFormatInfo& forma
     const bool isPart =
         sound.codec_id == AV_CODEC_ID_EAC3 && sound.frame_size > 0 && sound.frame_size < kWholeFrame;
     if (isPart && Has(format, kWriterFormatJoinsFrames))
-        throw Failure(Category::kRequest,
-                      fmt::format("{} cannot hold short frames of \"{}\" sound as it is; MKV can",
-                                  ShortName(format), avcodec_get_name(sound.codec_id)));
+        throw Failure(Category::kRequest, Say("{} cannot hold short frames of \"{}\" sound as it is; MKV can",
+                                              ShortName(format), SayCodec(avcodec_get_name(sound.codec_id))));
 }
 
 /// What `read` gives, with its errors as failures.
@@ -40,7 +39,7 @@ auto& OpenedBeside(Function read) {
     try {
         return read();
     } catch (const SourceError& error) {
-        throw Failure(Category::kRequest, error.what());
+        throw Failure(Category::kRequest, error.Words());
     }
 }
 
@@ -85,7 +84,7 @@ std::optional<NotCarried> FurtherTracks::AddFile(const SubtitleFileWish& wish, c
     stream.kind = StreamKind::kSubtitles;
     stream.codec = avcodec_get_name(described->codecpar->codec_id);
     stream.language = ThreeLetters(wish.language);
-    if (WhySubtitlesStay(stream, format_).empty()) {
+    if (WhySubtitlesStay(stream, format_).IsEmpty()) {
         WriterTrack track{};
         track.pParameters = described->codecpar;
         tracks_.push_back({track, &source, stream});

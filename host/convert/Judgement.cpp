@@ -2,9 +2,9 @@
 
 #include "api/MovieConv.h"
 #include "host/convert/Amounts.h"
+#include "host/sentence/Say.h"
 
 #include <filesystem>
-#include <fmt/format.h>
 #include <system_error>
 
 namespace movieconv {
@@ -22,33 +22,35 @@ bool HasShrunk(const SourceInfo& source) {
 /// Without a complete file, of which the writer keeps none that is empty.
 std::optional<Failure> WhyNothingIsThere(const Evidence& evidence) {
     const std::string& input = evidence.request.input;
-    if (evidence.userStopped && evidence.readError.empty())
+    if (evidence.userStopped && evidence.readError.IsEmpty())
         return std::nullopt;
-    return Failure(Category::kSource, evidence.readError.empty()
-                                          ? fmt::format("\"{}\" holds nothing to convert", input)
-                                          : fmt::format("cannot read \"{}\": {}", input, evidence.readError));
+    return Failure(Category::kSource, evidence.readError.IsEmpty()
+                                          ? Say("\"{}\" holds nothing to convert", input)
+                                          : Say("cannot read \"{}\": {}", input, evidence.readError));
 }
 
 } // namespace
 
-std::string WhyItEndedEarly(const Movie& movie, const Request& request, double reached) {
+Sentence WhyItEndedEarly(const Movie& movie, const Request& request, double reached) {
     const std::optional<Shortfall> missing = movie.Missing();
     const bool lengthReached = request.length && *request.length - reached <= kEarlyEnd;
     if (!missing || lengthReached)
         return {};
     if (HasShrunk(movie.Info()))
-        return "the file was cut meanwhile";
+        return Say("the file was cut meanwhile");
     if (missing->announced <= 0)
-        return "it is cut off";
-    return fmt::format("{}it ends at {} although it announces {}", missing->cutOff ? "it is cut off: " : "",
-                       FormatTime(missing->reached, true), FormatTime(missing->announced, true));
+        return Say("it is cut off");
+    const std::string end = FormatTime(missing->reached, true);
+    const std::string announced = FormatTime(missing->announced, true);
+    return missing->cutOff ? Say("it is cut off: it ends at {} although it announces {}", end, announced)
+                           : Say("it ends at {} although it announces {}", end, announced);
 }
 
 std::optional<Failure> FindExcess(const Request& request, const FileLedger& files) {
     if (!request.maxSize || files.Bytes() <= *request.maxSize)
         return std::nullopt;
-    return Failure(Category::kOutput, fmt::format("\"{}\" has become larger than asked for: {}",
-                                                  request.output, FormatBytes(files.Bytes())));
+    return Failure(Category::kOutput, Say("\"{}\" has become larger than asked for: {}", request.output,
+                                          SayAmount(FormatBytes(files.Bytes()))));
 }
 
 std::optional<Failure> FindFailure(const Evidence& evidence) {
@@ -58,18 +60,18 @@ std::optional<Failure> FindFailure(const Evidence& evidence) {
     const FileLedger& files = evidence.files;
     if (files.FirstFailure())
         return files.FirstFailure();
-    if (const std::optional<std::string> missing = files.FindMissing())
+    if (const std::optional<Sentence> missing = files.FindMissing())
         return Failure(Category::kOutput, *missing);
     if (files.Complete() == 0)
         return WhyNothingIsThere(evidence);
-    const std::string& reason = evidence.readError.empty() ? evidence.shortfall : evidence.readError;
-    if (!reason.empty() && !evidence.userStopped) {
-        const std::string reached = FormatTime(evidence.reached, true);
+    const Sentence& reason = evidence.readError.IsEmpty() ? evidence.shortfall : evidence.readError;
+    const std::string reached = FormatTime(evidence.reached, true);
+    if (!reason.IsEmpty() && !evidence.userStopped) {
         return Failure(Category::kSource,
                        request.piece // of which nothing is left
-                           ? fmt::format("reading \"{}\" failed after {}: {}", request.input, reached, reason)
-                           : fmt::format("reading \"{}\" failed after {}: {}; what was read is converted",
-                                         request.input, reached, reason));
+                           ? Say("reading \"{}\" failed after {}: {}", request.input, reached, reason)
+                           : Say("reading \"{}\" failed after {}: {}; what was read is converted",
+                                 request.input, reached, reason));
     }
     if (const std::optional<Failure> excess = FindExcess(request, files))
         return excess;
@@ -77,8 +79,9 @@ std::optional<Failure> FindFailure(const Evidence& evidence) {
         (evidence.userStopped && evidence.engineOutcome == kOutcomeStopped))
         return std::nullopt;
     return Failure(Category::kInternal,
-                   fmt::format("the conversion broke off after {}{}", FormatTime(evidence.reached, true),
-                               evidence.engineOutcome == kOutcomeFailed ? ", for want of memory" : ""));
+                   evidence.engineOutcome == kOutcomeFailed
+                       ? Say("the conversion broke off after {}, for want of memory", reached)
+                       : Say("the conversion broke off after {}", reached));
 }
 
 } // namespace movieconv

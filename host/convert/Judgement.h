@@ -16,8 +16,8 @@ struct Evidence {
     const Request& request;
     const FileLedger& files;          ///< By the writer's word, and by what stands on the disk now.
     std::optional<Failure> brokenOff; ///< Why the conversion itself was ended, not by its user.
-    std::string readError;            ///< Why reading ended early; empty when it did not.
-    std::string shortfall;            ///< What the source promised and did not hold; empty when nothing.
+    Sentence readError;               ///< Why reading ended early; empty when it did not.
+    Sentence shortfall;               ///< What the source promised and did not hold; empty when nothing.
     bool userStopped = false;
     int engineOutcome = 0; ///< kOutcome...
     double reached = 0;    ///< Seconds, in the source.
@@ -25,7 +25,7 @@ struct Evidence {
 
 /// Why the source ended before what it promises, and before the length that was asked for, of which so many
 /// seconds were reached; empty when it did not. Once the movie's streams ended.
-std::string WhyItEndedEarly(const Movie& movie, const Request& request, double reached);
+Sentence WhyItEndedEarly(const Movie& movie, const Request& request, double reached);
 
 /// Whether the files have become larger than the request allows.
 std::optional<Failure> FindExcess(const Request& request, const FileLedger& files);

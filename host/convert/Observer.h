@@ -77,7 +77,7 @@ struct Warning {
         kSource,       ///< Something was wrong with the source and has been put right or skipped.
     };
     Kind kind;
-    std::string text;       ///< A sentence without a full stop.
+    Sentence text;
     std::string input = {}; ///< As of OpenedFile.
 };
 
@@ -89,7 +89,7 @@ struct NotCarried {
     std::optional<int> number; ///< Of the stream in the source; nothing for chapters, tags and timecode.
     std::string codec;         ///< Of an attached file of no codec its name. Empty when it is not known.
     std::string language;      ///< Empty when it is not known.
-    std::string reason;        ///< A clause.
+    Sentence reason;           ///< A clause.
     std::string input = {};    ///< As of OpenedFile.
 };
 

@@ -2,6 +2,7 @@
 
 #include "api/MovieConv.h"
 #include "host/convert/Failure.h"
+#include "host/sentence/Say.h"
 #include "text/FileNames.h"
 #include "text/Path.h"
 #include "text/Utf8.h"
@@ -12,7 +13,6 @@
 #include <cmath>
 #include <cstring>
 #include <dirent.h>
-#include <fmt/format.h>
 #include <iterator>
 #include <memory>
 #include <optional>
@@ -36,37 +36,34 @@ void CheckTarget(const std::string& path, const Request& request) {
         if (lstat(path.c_str(), &target) == 0) {
             throw Failure(
                 Category::kOutput,
-                fmt::format("\"{}\" is a link to a missing file; name that file, or remove the link", path));
+                Say("\"{}\" is a link to a missing file; name that file, or remove the link", path));
         }
         return;
     }
-    if (const char* role = WhatIsReadFrom(path, request)) {
-        throw Failure(Category::kRequest,
-                      fmt::format("\"{}\" is {}; give the output another name", path, role));
-    }
+    if (const Sentence role = WhatIsReadFrom(path, request); !role.IsEmpty())
+        throw Failure(Category::kRequest, Say("\"{}\" is {}; give the output another name", path, role));
     if (S_ISDIR(target.st_mode))
-        throw Failure(Category::kOutput, fmt::format("\"{}\" is a folder; name a file in it", path));
+        throw Failure(Category::kOutput, Say("\"{}\" is a folder; name a file in it", path));
     if (!S_ISREG(target.st_mode)) {
         throw Failure(Category::kOutput,
-                      fmt::format("\"{}\" is not a file but a device or a pipe; name a file", path));
+                      Say("\"{}\" is not a file but a device or a pipe; name a file", path));
     }
     if (!request.overwrite) {
-        throw Failure(Category::kOutput, fmt::format("\"{}\" exists", path), Reason::kExists);
+        throw Failure(Category::kOutput, Say("\"{}\" exists", path), Reason::kExists);
     }
 }
 
 void CheckFolder(const std::string& folder) {
     struct stat status {};
     if (stat(folder.c_str(), &status) != 0) {
-        throw Failure(Category::kOutput, fmt::format("the output's folder \"{}\" cannot be used: {}", folder,
-                                                     std::strerror(errno)));
+        throw Failure(Category::kOutput,
+                      Say("the output's folder \"{}\" cannot be used: {}", folder, std::strerror(errno)));
     }
     if (!S_ISDIR(status.st_mode))
-        throw Failure(Category::kOutput, fmt::format("\"{}\" is not a folder", folder));
+        throw Failure(Category::kOutput, Say("\"{}\" is not a folder", folder));
     if (access(folder.c_str(), W_OK | X_OK) != 0) {
-        throw Failure(Category::kOutput,
-                      fmt::format("cannot create files in \"{}\": {}; choose another folder", folder,
-                                  std::strerror(errno)));
+        throw Failure(Category::kOutput, Say("cannot create files in \"{}\": {}; choose another folder",
+                                             folder, std::strerror(errno)));
     }
 }
 
@@ -91,16 +88,15 @@ void CheckClips(const Request& request) {
     const std::string name = text::NameOf(request.output);
     const auto [base, extension] = text::SplitName(std::string_view(name));
     if (base.empty() || extension.empty()) {
-        throw Failure(
-            Category::kRequest,
-            fmt::format("the name of a split output needs an extension, as in \"{}.mp4\"", request.output));
+        throw Failure(Category::kRequest, Say("the name of a split output needs an extension, as in \"{}\"",
+                                              request.output + ".mp4"));
     }
     const std::size_t pathCharacters = text::FromUtf8(request.output).size();
     if (pathCharacters + kClipNumberRoom > MC_MAX_TARGET_NAME ||
         extension.size() > text::kLongestClipExtension) {
         throw Failure(
             Category::kRequest,
-            fmt::format("the name \"{}\" is too long to number clips; choose a shorter one", request.output));
+            Say("the name \"{}\" is too long to number clips; choose a shorter one", request.output));
     }
     const std::string folder = text::FolderOf(request.output);
     CheckName(folder + "/" + text::ClipName(std::string_view(name), LastClip(request)));
@@ -133,25 +129,25 @@ std::optional<Warning> OlderClips(const std::string& output, int firstFree) {
     const auto count = std::distance(first, clips.end());
     if (count == 0)
         return std::nullopt;
-    return Warning{
-        Warning::Kind::kOlderClips,
-        count == 1 ? fmt::format("\"{}\" of an earlier conversion stays beside the new clips", first->second)
-                   : fmt::format("\"{}\" to \"{}\" of an earlier conversion stay beside the new clips",
-                                 first->second, clips.rbegin()->second)};
+    return Warning{Warning::Kind::kOlderClips,
+                   count == 1
+                       ? Say("\"{}\" of an earlier conversion stays beside the new clips", first->second)
+                       : Say("\"{}\" to \"{}\" of an earlier conversion stay beside the new clips",
+                             first->second, clips.rbegin()->second)};
 }
 
-const char* WhatIsReadFrom(const std::string& path, const Request& request) {
+Sentence WhatIsReadFrom(const std::string& path, const Request& request) {
     if (AreSame(path, request.input))
-        return "the source itself";
+        return Say("the source itself");
     const auto isPath = [&path](const SubtitleFileWish& wish) { return AreSame(path, wish.path); };
     const bool isText = std::any_of(request.subtitleFiles.begin(), request.subtitleFiles.end(), isPath) ||
                         AreSame(path, request.burnSubtitles);
-    return isText ? "a file of subtitles that is read" : nullptr;
+    return isText ? Say("a file of subtitles that is read") : Sentence();
 }
 
 void RemoveUnfinished(const std::string& output, const Request& request) {
     const std::string left = output + text::PartialSuffix(1);
-    if (WhatIsReadFrom(left, request) == nullptr)
+    if (WhatIsReadFrom(left, request).IsEmpty())
         unlink(left.c_str());
 }
 
@@ -174,9 +170,8 @@ void CheckName(const std::string& path, const std::string& suffix) {
     const bool refused = lstat(whole.c_str(), &status) != 0 && errno == ENAMETOOLONG;
     const std::string name = text::NameOf(whole);
     if (refused || (most >= 0 && name.size() > static_cast<std::size_t>(most))) {
-        throw Failure(
-            Category::kOutput,
-            fmt::format("the name \"{}\" is too long for its file system; choose a shorter one", path));
+        throw Failure(Category::kOutput,
+                      Say("the name \"{}\" is too long for its file system; choose a shorter one", path));
     }
 }
 

@@ -6,9 +6,9 @@
 #include "host/convert/Failure.h"
 #include "host/convert/SizePlan.h"
 #include "host/convert/Sources.h"
+#include "host/sentence/Say.h"
 #include "text/Path.h"
 
-#include <fmt/format.h>
 #include <sys/statvfs.h>
 
 namespace movieconv {
@@ -22,15 +22,15 @@ int64_t FreeBytes(const std::string& folder) {
 
 Warning WaitsForRoom(const std::string& output, int64_t bytes) {
     return {Warning::Kind::kWaitsForRoom,
-            fmt::format("no space is left for \"{}\"; waiting until there is room for {}", output,
-                        FormatBytes(bytes))};
+            Say("no space is left for \"{}\"; waiting until there is room for {}", output,
+                SayAmount(FormatBytes(bytes)))};
 }
 
 Room EstimateRoom(const Request& request) {
     ChooseFormat(request);
     Movie movie = OpenMovie(request);
     if (movie.Info().certainty == Certainty::kGuessed && !request.length) {
-        throw Failure(Category::kRequest, fmt::format("\"{}\" does not tell how long it is", request.input),
+        throw Failure(Category::kRequest, Say("\"{}\" does not tell how long it is", request.input),
                       Reason::kUnknownLength);
     }
     const double length = LengthToConvert(request, movie.Info());

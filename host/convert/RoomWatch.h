@@ -32,7 +32,8 @@ public:
     void Check(const Progress& report);
 
 private:
-    void Warn(int64_t further, const std::string& needed);
+    template <class Tell>
+    void Warn(int64_t further, Tell tell);
 
     const std::string output_;
     Observer& observer_;

@@ -7,6 +7,7 @@
 #include "host/convert/EncodePlan.h"
 #include "host/convert/Failure.h"
 #include "host/convert/Formats.h"
+#include "host/sentence/Say.h"
 #include "media/FourCC.h"
 #include "media/Limits.h"
 #include "writer/WriterStatus.h"
@@ -14,7 +15,6 @@
 #include <algorithm>
 #include <cmath>
 #include <cstdint>
-#include <fmt/format.h>
 #include <numeric>
 #include <vector>
 
@@ -126,14 +126,14 @@ Request FitIntoSize(Request request, const SourceInfo& source) {
         return request;
     const FileFormatInfo& format = ChooseFormat(request);
     if (source.certainty == Certainty::kGuessed && !request.length) {
-        throw Failure(Category::kRequest, fmt::format("\"{}\" does not tell how long it is", request.input),
+        throw Failure(Category::kRequest, Say("\"{}\" does not tell how long it is", request.input),
                       Reason::kUnknownLength);
     }
     const double length = std::max(LengthToConvert(request, source), 0.001);
     const bool pictures = source.pictures && format.bHasVideo != 0;
     const bool sound = source.sound && format.bHasAudio != 0;
     if (pictures && !QualityScaleOf(PictureCodecFor(request, format)))
-        throw Failure(Category::kRequest, "a codec without a bit rate cannot keep below a size");
+        throw Failure(Category::kRequest, Say("a codec without a bit rate cannot keep below a size"));
     const bool packets = Has(format, kWriterFormatSmallPackets);
     const auto tracks = static_cast<double>(1 + CarryPlan(source, request, format).FurtherSound().size());
     const double packetRate = (pictures ? source.pictures->peakRate : 0) +
@@ -144,9 +144,9 @@ Request FitIntoSize(Request request, const SourceInfo& source) {
     const double soundRate = sound ? tracks * FitSound(request, format, *source.sound, share) : 0;
     const double pictureRate = (free - soundRate * length) / (length + kBufferSeconds);
     if (pictureRate < (pictures ? kLeastPictureRate : -1)) { // sound alone takes all but what rounding leaves
-        throw Failure(
-            Category::kRequest,
-            fmt::format("{} are too little for {}", FormatBytes(*request.maxSize), FormatTime(length, true)));
+        throw Failure(Category::kRequest,
+                      Say("{} are too little for {}", SayAmount(FormatBytes(*request.maxSize)),
+                          FormatTime(length, true)));
     }
     if (pictures)
         FitPictures(request, format, *source.pictures, pictureRate);
@@ -170,15 +170,20 @@ std::optional<int64_t> NeededBytes(EncodeParam param, const Request& request, co
     return MCGetEstimateDiskSpaceEx(&param, length);
 }
 
-std::string TellSize(const Request& fitted) {
-    std::string text = fmt::format("to keep below {}:", FormatBytes(fitted.maxSize.value_or(0)));
+Sentence TellSize(const Request& fitted) {
+    const Sentence most = SayAmount(FormatBytes(fitted.maxSize.value_or(0)));
+    Sentence pictures;
     if (fitted.videoRate)
-        text +=
-            fmt::format(" pictures at {} kbit/s{}", *fitted.videoRate / 1000,
-                        fitted.size ? fmt::format(" in {}x{}", fitted.size->width, fitted.size->height) : "");
-    if (fitted.audioRate)
-        text += fmt::format("{} sound at {} kbit/s", fitted.videoRate ? "," : "", *fitted.audioRate / 1000);
-    return text;
+        pictures = fitted.size ? Say("pictures at {} kbit/s in {}x{}", *fitted.videoRate / 1000,
+                                     fitted.size->width, fitted.size->height)
+                               : Say("pictures at {} kbit/s", *fitted.videoRate / 1000);
+    const Sentence sound =
+        fitted.audioRate ? Say("sound at {} kbit/s", *fitted.audioRate / 1000) : Sentence();
+    if (fitted.videoRate && fitted.audioRate)
+        return Say("to keep below {}: {}, {}", most, pictures, sound);
+    return fitted.videoRate || fitted.audioRate
+               ? Say("to keep below {}: {}", most, fitted.videoRate ? pictures : sound)
+               : Say("to keep below {}:", most);
 }
 
 } // namespace movieconv

@@ -22,7 +22,7 @@ std::optional<int64_t> NeededBytes(EncodeParam param, const Request& request, co
                                    double length);
 
 /// What was chosen, a sentence for people.
-std::string TellSize(const Request& fitted);
+Sentence TellSize(const Request& fitted);
 
 } // namespace movieconv
 

@@ -4,11 +4,11 @@
 #include "host/convert/CarryPlan.h"
 #include "host/convert/CodecPlan.h"
 #include "host/convert/EncodePlan.h"
+#include "host/sentence/Say.h"
 #include "writer/WriterStatus.h"
 
 #include <algorithm>
 #include <array>
-#include <fmt/format.h>
 #include <utility>
 
 namespace movieconv {
@@ -24,7 +24,7 @@ std::string LayoutName(uint64_t speakers) {
 }
 
 void TellLossOf(const SoundStreamInfo& sound, const SoundPlan& plan, EncodeParam param,
-                std::vector<std::string>& texts) {
+                std::vector<Sentence>& texts) {
     const int channels = plan.channels.value_or(sound.channels);
     const int rate = plan.sampleRate.value_or(sound.sampleRate);
     param.nChannels = channels;
@@ -37,19 +37,18 @@ void TellLossOf(const SoundStreamInfo& sound, const SoundPlan& plan, EncodeParam
         return;
     const uint64_t asked = av::SpeakersFor(channels, sound.speakers);
     if (asked == 0 && written.nChannels < channels)
-        texts.push_back(fmt::format("its sound of {} channels got {}", channels, written.nChannels));
+        texts.push_back(Say("its sound of {} channels got {}", channels, written.nChannels));
     if ((av::AlikeSpeakers(asked) & ~av::AlikeSpeakers(written.nChannelMask)) != 0)
-        texts.push_back(
-            fmt::format("its {} sound became {}", LayoutName(asked), LayoutName(written.nChannelMask)));
+        texts.push_back(Say("its {} sound became {}", LayoutName(asked), LayoutName(written.nChannelMask)));
     if (written.nSampleRate < rate)
-        texts.push_back(fmt::format("its sound of {} Hz got {}", rate, written.nSampleRate));
+        texts.push_back(Say("its sound of {} Hz got {}", rate, written.nSampleRate));
 }
 
 } // namespace
 
-std::vector<std::string> TellSoundLoss(const SourceInfo& source, const Request& request,
-                                       const EncodeParam& param) {
-    std::vector<std::string> texts;
+std::vector<Sentence> TellSoundLoss(const SourceInfo& source, const Request& request,
+                                    const EncodeParam& param) {
+    std::vector<Sentence> texts;
     if (!source.sound || request.copySound || param.bNoAudio != 0)
         return texts;
     const FileFormatInfo& format = ChooseFormat(request);

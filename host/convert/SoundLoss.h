@@ -12,8 +12,8 @@
 namespace movieconv {
 
 /// A sentence each, without what was asked for. `param` as for the conversion.
-std::vector<std::string> TellSoundLoss(const SourceInfo& source, const Request& request,
-                                       const EncodeParam& param);
+std::vector<Sentence> TellSoundLoss(const SourceInfo& source, const Request& request,
+                                    const EncodeParam& param);
 
 } // namespace movieconv
 

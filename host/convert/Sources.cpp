@@ -3,12 +3,12 @@
 #include "host/convert/CodecPlan.h"
 #include "host/convert/EncodePlan.h"
 #include "host/convert/Failure.h"
+#include "host/sentence/Say.h"
 #include "host/source/CropDetection.h"
 #include "host/source/MediaTime.h"
 #include "host/source/StreamChoice.h"
 
 #include <cstddef>
-#include <fmt/format.h>
 #include <utility>
 
 namespace movieconv {
@@ -41,7 +41,7 @@ SourceChoice CroppedChoiceOf(const Request& request, const std::shared_ptr<Inter
 /// Throws Failure when there are no pictures to draw them into.
 BurnWish BurnOf(const Request& request) {
     if (request.noVideo || ChooseFormat(request).bHasVideo == 0)
-        throw Failure(Category::kRequest, "there are no pictures in the output to draw subtitles into");
+        throw Failure(Category::kRequest, Say("there are no pictures in the output to draw subtitles into"));
     BurnWish wish{request.burnSubtitles, request.subtitleCharset, ToMediaTime(request.begin)};
     if (request.length)
         wish.end = ToMediaTime(request.begin + *request.length);
@@ -70,15 +70,15 @@ auto Opened(Open open) {
     try {
         return open();
     } catch (const PlaylistError& error) {
-        throw Failure(Category::kSource, error.what(), Reason::kPlaylist);
+        throw Failure(Category::kSource, error.Words(), Reason::kPlaylist);
     } catch (const TrackError& error) {
-        throw Failure(Category::kRequest, error.what());
+        throw Failure(Category::kRequest, error.Words());
     } catch (const CropError& error) {
-        throw Failure(Category::kRequest, error.what());
+        throw Failure(Category::kRequest, error.Words());
     } catch (const ScratchError& error) {
-        throw Failure(Category::kOutput, error.what());
+        throw Failure(Category::kOutput, error.Words());
     } catch (const SourceError& error) {
-        throw Failure(Category::kSource, error.what());
+        throw Failure(Category::kSource, error.Words());
     }
 }
 
@@ -94,15 +94,15 @@ SourceInfo LookAtSource(const Request& request) {
         [&] { return Source(request.input, CroppedChoiceOf(request, interruption), interruption).Info(); });
 }
 
-std::string TellCrop(const SourceInfo& source) {
+Sentence TellCrop(const SourceInfo& source) {
     const PictureStreamInfo& pictures = *source.pictures;
     const Crop& crop = pictures.crop;
     if (!CanBeLookedAtBefore(source.path))
-        return "black borders cannot be looked for in a pipe";
+        return Say("black borders cannot be looked for in a pipe");
     if (crop.CutsNothing())
-        return "no black borders were found";
-    return fmt::format("the pictures are cropped to {}x{}: {} above, {} below, {} left, {} right",
-                       pictures.width, pictures.height, crop.top, crop.bottom, crop.left, crop.right);
+        return Say("no black borders were found");
+    return Say("the pictures are cropped to {}x{}: {} above, {} below, {} left, {} right", pictures.width,
+               pictures.height, crop.top, crop.bottom, crop.left, crop.right);
 }
 
 SourceInfo AsAskedFor(SourceInfo source, const Request& request) {

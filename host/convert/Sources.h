@@ -18,7 +18,7 @@ Movie OpenMovie(const Request& request,
 SourceInfo LookAtSource(const Request& request);
 
 /// How the pictures were cropped, where that was looked for.
-std::string TellCrop(const SourceInfo& source);
+Sentence TellCrop(const SourceInfo& source);
 
 /// A source that was looked at, whatever was chosen then, with the pictures and the sound that the request
 /// chooses. Of others than before there is only what the container tells. Throws Failure when a track that is

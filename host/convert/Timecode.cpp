@@ -3,6 +3,7 @@
 #include "ffmpeg/ExactRate.h"
 #include "host/convert/CodecPlan.h"
 #include "host/convert/Formats.h"
+#include "host/sentence/Say.h"
 #include "writer/WriterStatus.h"
 
 #include <algorithm>
@@ -111,13 +112,13 @@ std::optional<NotCarried> WhyTimecodeStays(const SourceInfo& source, const Reque
     const std::string* timecode = FindTimecode(source, request);
     if (timecode == nullptr)
         return std::nullopt;
-    std::string reason;
+    Sentence reason;
     if (!Has(format, kWriterFormatTimecode))
-        reason = CannotHold(format, "it");
+        reason = Say("{} cannot hold it", ShortName(format));
     else if (!HasPictures(source, request))
-        reason = "it belongs to the pictures";
+        reason = Say("it belongs to the pictures");
     else if (AVTimecode counted{}; !Parse(*timecode, source.pictures->frameRate, counted))
-        reason = fmt::format("\"{}\" makes no sense", *timecode);
+        reason = Say("\"{}\" makes no sense", *timecode);
     else
         return std::nullopt;
     return NotCarried{kKey, std::nullopt, {}, {}, std::move(reason)};

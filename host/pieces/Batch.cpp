@@ -8,6 +8,7 @@
 #include "host/pieces/OutputNames.h"
 #include "host/pieces/PlanChecks.h"
 #include "host/pieces/SettingsText.h"
+#include "host/sentence/Say.h"
 
 #include <algorithm>
 #include <filesystem>
@@ -91,13 +92,13 @@ std::string SettingsOf(Request request) {
 }
 
 /// Why a file that was found in a folder is none; empty when it is one.
-std::string WhyNoMovie(Request request) {
+Sentence WhyNoMovie(Request request) {
     request.detectCrop = false; // which takes long and does not matter here
     try {
         LookAtSource(request);
         return {};
     } catch (const Failure& failure) {
-        return failure.Text();
+        return failure.Words();
     }
 }
 
@@ -184,7 +185,7 @@ void Batch::RequireOwnOutputs(const std::vector<Movie>& movies) {
             continue;
         those.erase(std::remove_if(those.begin(), those.end(),
                                    [this](const Movie* movie) {
-                                       return !movie->named && !WhyNoMovie(RequestFor(*movie)).empty();
+                                       return !movie->named && !WhyNoMovie(RequestFor(*movie)).IsEmpty();
                                    }),
                     those.end());
         if (those.size() > 1)
@@ -277,11 +278,11 @@ void Batch::RemoveUnfinished(const std::string& output) const {
 
 /// Of a file that was found in a folder; tells why not.
 bool Batch::IsMovie(const Request& request) {
-    const std::string why = WhyNoMovie(request);
-    if (!why.empty())
-        News().Warned({Warning::Kind::kSource, fmt::format("\"{}\" is left out: {}", request.input, why),
-                       request.input});
-    return why.empty();
+    const Sentence why = WhyNoMovie(request);
+    if (!why.IsEmpty())
+        News().Warned(
+            {Warning::Kind::kSource, Say("\"{}\" is left out: {}", request.input, why), request.input});
+    return why.IsEmpty();
 }
 
 void Batch::Take(const std::string& input, const Verdict& ending) {
@@ -296,7 +297,7 @@ void Batch::Take(const std::string& input, const Verdict& ending) {
 
 void Batch::Fail(const std::string& input, const Failure& failure) {
     ++failed_;
-    News().Warned({Warning::Kind::kFailed, fmt::format("\"{}\": {}", input, failure.Text()), input});
+    News().Warned({Warning::Kind::kFailed, Say("\"{}\": {}", input, failure.Words()), input});
     if (!worst_ || Badness(failure.Kind()) > Badness(worst_->Kind()))
         worst_ = failure;
 }

@@ -196,7 +196,7 @@ void ClipJournal::Remove() const {
     std::error_code ignored;
     for (const std::filesystem::path& left : FilesThatBegin(path_))
         if (IsInTheMaking(left, path_) && BeginsLike(left, kClipListHead) &&
-            WhatIsReadFrom(left.string(), request_) == nullptr)
+            WhatIsReadFrom(left.string(), request_).IsEmpty())
             std::filesystem::remove(left, ignored);
 }
 

@@ -165,11 +165,11 @@ private:
 Verdict VerdictOn(const Plan& plan, const Request& request, const FileLedger& files) {
     Verdict verdict;
     verdict.failure = files.FirstFailure();
-    const std::optional<std::string> missing = files.FindMissing();
+    const std::optional<Sentence> missing = files.FindMissing();
     if (missing && !verdict.failure)
         verdict.failure = Failure(Category::kOutput, *missing);
     if (!verdict.failure && files.Complete() != 1)
-        verdict.failure = Failure(Category::kInternal, "the pieces were not joined");
+        verdict.failure = Failure(Category::kInternal, Sentence("the pieces were not joined"));
     if (!verdict.failure)
         verdict.failure = FindExcess(request, files);
     verdict.outcome = verdict.failure ? Outcome::kFailed : Outcome::kDone;

@@ -6,6 +6,7 @@
 #include "host/pieces/OutputNames.h"
 #include "host/pieces/PlanText.h"
 #include "host/pieces/WholeFile.h"
+#include "host/sentence/Say.h"
 #include "text/Descriptor.h"
 #include "text/FileNames.h"
 #include "text/LastingFile.h"
@@ -144,11 +145,10 @@ void RequirePlaces(const std::string& planPath, const Request& request, std::opt
         const std::optional<int> number = PieceNumber(file, planPath);
         if (!number || (only && number != only))
             continue;
-        if (const char* role = WhatIsReadFrom(file.string(), request))
-            throw Failure(Category::kRequest,
-                          fmt::format("\"{}\" is {}, and has the name of a piece that is to "
-                                      "be made; rename it, or give the output another name",
-                                      file.string(), role));
+        if (const Sentence role = WhatIsReadFrom(file.string(), request); !role.IsEmpty())
+            throw Failure(Category::kRequest, Say("\"{}\" is {}, and has the name of a piece that is to "
+                                                  "be made; rename it, or give the output another name",
+                                                  file.string(), role));
         if (!BeginsLike(file, kPieceHead))
             throw Failure(Category::kOutput,
                           fmt::format("a piece would replace another file, \"{}\"; rename or "
@@ -167,7 +167,7 @@ int CountPieces(const std::string& planPath) {
 void RemovePieces(const std::string& planPath, const Request& request) {
     std::error_code ignored;
     for (const std::filesystem::path& file : FilesOf(planPath))
-        if (WhatIsReadFrom(file.string(), request) == nullptr)
+        if (WhatIsReadFrom(file.string(), request).IsEmpty())
             std::filesystem::remove(file, ignored);
 }
 

@@ -12,6 +12,7 @@
 #include "host/convert/WriterPlan.h"
 #include "host/convert/WriterSet.h"
 #include "host/pieces/PlanChecks.h"
+#include "host/sentence/Say.h"
 #include "host/source/MediaTime.h"
 #include "media/FourCC.h"
 #include "media/MediaWriter.h"
@@ -65,8 +66,8 @@ Request StampRequest(const Plan& plan) {
 /// Throws Failure where pieces would, after much work.
 void RequireAll(const Movie& movie, const Request& request, const Stamps& stamps) {
     const std::string& path = request.input;
-    if (const std::string error = movie.ReadError(); !error.empty())
-        throw Failure(Category::kSource, fmt::format("reading \"{}\" failed: {}", path, error));
+    if (const Sentence error = movie.ReadError(); !error.IsEmpty())
+        throw Failure(Category::kSource, Say("reading \"{}\" failed: {}", path, error));
     if (movie.UnstampedPictures() > 0)
         throw Failure(
             Category::kSource,
@@ -76,10 +77,10 @@ void RequireAll(const Movie& movie, const Request& request, const Stamps& stamps
     if (stamps.times.empty())
         throw Failure(Category::kSource, fmt::format("\"{}\" holds no pictures to convert", path));
     const double reached = ToSeconds(stamps.end) - request.begin;
-    if (const std::string why = WhyItEndedEarly(movie, request, reached); !why.empty())
+    if (const Sentence why = WhyItEndedEarly(movie, request, reached); !why.IsEmpty())
         throw Failure(Category::kSource,
-                      fmt::format("reading \"{}\" failed after {}: {}; it can only be converted undivided",
-                                  path, FormatTime(ToSeconds(stamps.end), true), why));
+                      Say("reading \"{}\" failed after {}: {}; it can only be converted undivided", path,
+                          FormatTime(ToSeconds(stamps.end), true), why));
 }
 
 std::optional<Stamps> ReadStamps(Movie& movie, const Request& request, const std::function<bool()>& stopped) {
@@ -161,7 +162,7 @@ std::vector<std::optional<int64_t>> TicksBefore(EncodeParam param, const Request
         time -= stamps.times.front();
     std::vector<int64_t> ticks(times.size());
     if (MWPlanTicks(&param, &format, times.data(), static_cast<int64_t>(times.size()), ticks.data()) == 0)
-        throw Failure(Category::kInternal, "the pictures cannot be placed in the output");
+        throw Failure(Category::kInternal, Sentence("the pictures cannot be placed in the output"));
     std::vector<std::optional<int64_t>> before;
     before.reserve(ticks.size());
     for (const int64_t tick : ticks)

@@ -72,7 +72,7 @@ std::vector<SourceMark> MarkTexts(Request& request) {
         try {
             marks.push_back(MarkOf(*name));
         } catch (const Failure& failure) {
-            throw Failure(Category::kRequest, failure.Text());
+            throw Failure(Category::kRequest, failure.Words());
         }
         *name = marks.back().path;
     }

@@ -3,6 +3,7 @@
 #include "host/presets/BuiltIn.h"
 #include "host/presets/PresetReader.h"
 #include "host/presets/PresetText.h"
+#include "host/sentence/Say.h"
 #include "text/Path.h"
 
 #include <algorithm>
@@ -57,7 +58,7 @@ public:
     }
 
     const std::vector<PresetText>& Texts() const { return texts_; }
-    std::vector<std::string>& Complaints() { return complaints_; }
+    std::vector<Sentence>& Complaints() { return complaints_; }
 
 private:
     /// Without a word about it the parent is the standard; null means none.
@@ -88,16 +89,14 @@ private:
             return ReadPresetFile(path);
         if (builtIn != nullptr && !IsOpen(builtInPlace)) // one's own may have the program's as its parent
             return ParsePresetText(std::string(builtIn->text), builtInPlace);
-        const std::string place = asker.empty() ? "" : asker + ": ";
         if (IsFileName(name) || Exists(path) || builtIn != nullptr)
-            throw PresetError(
-                fmt::format("{}the parent \"{}\" has this preset as a parent itself", place, name));
-        throw PresetError(
-            fmt::format("{}there is no preset \"{}\"; see \"movieconv --list-presets\"", place, name));
+            throw PresetError(Say("{}: the parent \"{}\" has this preset as a parent itself", asker, name));
+        throw NoPresetError(asker.empty() ? Say("there is no preset \"{}\"", name)
+                                          : Say("{}: there is no preset \"{}\"", asker, name));
     }
 
     std::vector<PresetText> texts_;
-    std::vector<std::string> complaints_;
+    std::vector<Sentence> complaints_;
 };
 
 std::string DescriptionIn(const Json& json) {
@@ -121,7 +120,7 @@ PresetSummary Summarise(const std::string& path) {
 
 Preset LoadPreset(const std::string& nameOrFile) {
     if (nameOrFile.empty())
-        throw PresetError("a preset has a name");
+        throw PresetError(Say("a preset has a name"));
     Chain chain(nameOrFile);
     const auto& texts = chain.Texts();
     Json merged = Json::object();
@@ -131,7 +130,7 @@ Preset LoadPreset(const std::string& nameOrFile) {
         merged.erase("parent");
         merged.erase("$schema");
     });
-    std::vector<std::string> toldAlready;
+    std::vector<Sentence> toldAlready;
     Preset preset{nameOrFile, DescriptionIn(merged), {}, merged.dump(4), std::move(chain.Complaints())};
     preset.preferences = ReadPreferences({nameOrFile, merged, {}}, toldAlready);
     return preset;

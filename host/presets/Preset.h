@@ -4,25 +4,31 @@
 #define MOVIECONV_HOST_PRESETS_PRESET_H
 
 #include "host/convert/Preferences.h"
+#include "host/sentence/SentenceError.h"
 
-#include <stdexcept>
 #include <string>
 #include <vector>
 
 namespace movieconv {
 
 /// A preset that cannot be used: where, with the line if there is one, and why.
-class PresetError : public std::runtime_error {
+class PresetError : public SentenceError {
 public:
-    using std::runtime_error::runtime_error;
+    using SentenceError::SentenceError;
+};
+
+/// There is no preset of that name.
+class NoPresetError : public PresetError {
+public:
+    using PresetError::PresetError;
 };
 
 struct Preset {
     std::string name; ///< As it was asked for.
     std::string description;
     Preferences preferences;
-    std::string text;                    ///< As JSON with all that its parents say; unknown keys are kept.
-    std::vector<std::string> complaints; ///< Where and which the unknown keys are.
+    std::string text;                 ///< As JSON with all that its parents say; unknown keys are kept.
+    std::vector<Sentence> complaints; ///< Where and which the unknown keys are.
 };
 
 /// What is to be told of a preset without using it.

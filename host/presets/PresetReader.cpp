@@ -3,6 +3,7 @@
 #include "host/convert/Formats.h"
 #include "host/presets/Notation.h"
 #include "host/presets/Preset.h"
+#include "host/sentence/Say.h"
 #include "media/Limits.h"
 
 #include <algorithm>
@@ -80,7 +81,7 @@ auto Within(int32_t least, int32_t most) {
 
 class Reader {
 public:
-    Reader(const PresetText& text, std::vector<std::string>& complaints)
+    Reader(const PresetText& text, std::vector<Sentence>& complaints)
         : text_(text), complaints_(complaints) {}
 
     Preferences Read() {
@@ -89,10 +90,10 @@ public:
         };
         std::string ignored;
         TakeMembers(text_.json, "",
-                    {{"$schema", Taking(ignored, isText, "a text")},
-                     {"description", Taking(ignored, isText, "a text")},
-                     {"parent", Taking(ignored, isText, "the name of a preset, or null")},
-                     {"format", Taking(preferences_.format, &AsFormat, "a format's code or extension")},
+                    {{"$schema", Taking(ignored, isText, Say("a text"))},
+                     {"description", Taking(ignored, isText, Say("a text"))},
+                     {"parent", Taking(ignored, isText, Say("the name of a preset, or null"))},
+                     {"format", Taking(preferences_.format, &AsFormat, Say("a format's code or extension"))},
                      {"video", [this](const Json& value, const std::string& at) { TakeVideo(value, at); }},
                      {"audio", [this](const Json& value, const std::string& at) { TakeAudio(value, at); }}});
         return preferences_;
@@ -104,15 +105,15 @@ private:
 
     static std::optional<uint32_t> AsFormat(const Json& value) { return AsCode(value); }
 
-    [[noreturn]] void Refuse(const std::string& pointer, const std::string& wanted) const {
+    [[noreturn]] void Refuse(const std::string& pointer, const Sentence& wanted) const {
         std::string name = pointer.substr(1);
         std::replace(name.begin(), name.end(), '/', '.');
-        throw PresetError(fmt::format("{}: \"{}\" has to be {}", text_.Place(pointer), name, wanted));
+        throw PresetError(Say("{}: \"{}\" has to be {}", text_.Place(pointer), name, wanted));
     }
 
     /// Puts what `as` makes of the value into `target`; null leaves the target alone.
     template <class Target, class As>
-    Take Taking(Target& target, As as, const char* wanted) const {
+    Take Taking(Target& target, As as, const Sentence& wanted) const {
         return [this, &target, as, wanted](const Json& value, const std::string& pointer) {
             const auto read = as(value);
             if (!read)
@@ -123,7 +124,8 @@ private:
 
     /// A figure alone, or a ladder of them.
     template <class Figure, class As>
-    Steps<Figure> AsSteps(const Json& value, const std::string& pointer, As as, const char* wanted) const {
+    Steps<Figure> AsSteps(const Json& value, const std::string& pointer, As as,
+                          const Sentence& wanted) const {
         Steps<Figure> steps;
         const auto take = [&](int bound, const Json& figure, const std::string& at) {
             const auto read = as(figure);
@@ -142,13 +144,13 @@ private:
 
     void TakeMembers(const Json& object, const std::string& pointer, const Members& known) {
         if (!object.is_object())
-            Refuse(pointer, "an object, in braces");
+            Refuse(pointer, Say("an object, in braces"));
         for (const auto& [key, value] : object.items()) {
             const std::string at = fmt::format("{}/{}", pointer, key);
             const auto found = known.find(key);
             if (found == known.end())
-                complaints_.push_back(fmt::format("{}: there is no \"{}\" in presets; it has no effect",
-                                                  text_.Place(at), at.substr(1)));
+                complaints_.push_back(Say("{}: there is no \"{}\" in presets; it has no effect",
+                                          text_.Place(at), at.substr(1)));
             else if (!value.is_null())
                 found->second(value, at);
         }
@@ -160,16 +162,16 @@ private:
             for (const Json& code : value.is_array() ? value : Json::array({value})) {
                 const std::optional<uint32_t> read = AsCode(code);
                 if (!read)
-                    Refuse(pointer, "a codec's code of up to four characters, or a list of them");
+                    Refuse(pointer, Say("a codec's code of up to four characters, or a list of them"));
                 codecs.push_back(*read);
             }
         };
     }
 
     void TakeQuality(const Json& value, const std::string& pointer) {
-        constexpr const char* kWanted = "a number from 0 to 63, or such numbers by picture height or codec";
+        const Sentence wanted = Say("a number from 0 to 63, or such numbers by picture height or codec");
         const auto steps = [&](const Json& figures, const std::string& at) {
-            return AsSteps<double>(figures, at, &AsQuality, kWanted);
+            return AsSteps<double>(figures, at, &AsQuality, wanted);
         };
         if (!value.is_object() || IsLadder(value)) {
             const uint32_t codec =
@@ -180,30 +182,29 @@ private:
         for (const auto& [name, figures] : value.items()) {
             const std::optional<uint32_t> codec = ParseCode(name);
             if (!codec)
-                Refuse(pointer, kWanted);
+                Refuse(pointer, wanted);
             preferences_.quality[*codec] = steps(figures, fmt::format("{}/{}", pointer, name));
         }
     }
 
     void TakeVideo(const Json& value, const std::string& pointer) {
-        constexpr const char* kRate = "a bit rate such as \"1.5M\"";
-        static const std::string kFrameRate = fmt::format(
-            "a frame rate from {} to {}, such as 25 or \"30000/1001\"", kLowestFrameRate, kHighestFrameRate);
+        const Sentence rate = Say("a bit rate such as \"{}\"", "1.5M");
+        const Sentence frameRate = Say("a frame rate from {} to {}, such as 25 or \"{}\"", kLowestFrameRate,
+                                       kHighestFrameRate, "30000/1001");
         Preferences& into = preferences_;
         TakeMembers(
             value, pointer,
             {{"codec", TakingCodecs(into.videoCodecs)},
              {"quality", [this](const Json& figures, const std::string& at) { TakeQuality(figures, at); }},
-             {"rate", Taking(into.videoRate, &AsRate, kRate)},
-             {"max_rate", Taking(into.videoMaxRate, &AsRate, kRate)},
+             {"rate", Taking(into.videoRate, &AsRate, rate)},
+             {"max_rate", Taking(into.videoMaxRate, &AsRate, rate)},
              {"speed", Taking(into.speed, Among<Speed>(kSpeedNames),
-                              "slowest, slower, slow, medium, fast, "
-                              "faster or fastest")},
-             {"profile", Taking(into.profile, Among<Profile>(kProfileNames), "baseline, main or high")},
-             {"fit_within", Taking(into.fitWithin, &AsSize, "a size such as \"1280x720\"")},
-             {"frame_rate", Taking(into.frameRate, &AsFrameRate, kFrameRate.c_str())},
-             {"max_frame_rate", Taking(into.maxFrameRate, &AsFrameRate, kFrameRate.c_str())},
-             {"leave_out", Taking(into.noVideo, &AsFlag, "true or false")}});
+                              Say("slowest, slower, slow, medium, fast, faster or fastest"))},
+             {"profile", Taking(into.profile, Among<Profile>(kProfileNames), Say("baseline, main or high"))},
+             {"fit_within", Taking(into.fitWithin, &AsSize, Say("a size such as \"{}\"", "1280x720"))},
+             {"frame_rate", Taking(into.frameRate, &AsFrameRate, frameRate)},
+             {"max_frame_rate", Taking(into.maxFrameRate, &AsFrameRate, frameRate)},
+             {"leave_out", Taking(into.noVideo, &AsFlag, Say("true or false"))}});
     }
 
     /// The codec may be "copy", which is no code: sound stays as it is.
@@ -214,23 +215,24 @@ private:
     }
 
     void TakeAudio(const Json& value, const std::string& pointer) {
-        constexpr const char* kRate = "a bit rate such as \"160k\", or such rates by number of channels";
+        const Sentence rate = Say("a bit rate such as \"{}\", or such rates by number of channels", "160k");
         Preferences& into = preferences_;
         TakeMembers(
             value, pointer,
             {{"codec", [this](const Json& codec, const std::string& at) { TakeSoundCodec(codec, at); }},
              {"rate",
               [&](const Json& rates, const std::string& at) {
-                  into.audioRate = AsSteps<int32_t>(rates, at, &AsRate, kRate);
+                  into.audioRate = AsSteps<int32_t>(rates, at, &AsRate, rate);
               }},
-             {"channels", Taking(into.channels, Within(1, 8), "a number from 1 to 8")},
-             {"max_channels", Taking(into.maxChannels, Within(1, 8), "a number from 1 to 8")},
-             {"sample_rate", Taking(into.sampleRate, Within(4000, 384000), "a number from 4000 to 384000")},
-             {"leave_out", Taking(into.noAudio, &AsFlag, "true or false")}});
+             {"channels", Taking(into.channels, Within(1, 8), Say("a number from 1 to 8"))},
+             {"max_channels", Taking(into.maxChannels, Within(1, 8), Say("a number from 1 to 8"))},
+             {"sample_rate",
+              Taking(into.sampleRate, Within(4000, 384000), Say("a number from 4000 to 384000"))},
+             {"leave_out", Taking(into.noAudio, &AsFlag, Say("true or false"))}});
     }
 
     const PresetText& text_;
-    std::vector<std::string>& complaints_;
+    std::vector<Sentence>& complaints_;
     Preferences preferences_;
 };
 
@@ -273,7 +275,7 @@ void MergeVideo(Json& into, Json from) {
 
 } // namespace
 
-Preferences ReadPreferences(const PresetText& text, std::vector<std::string>& complaints) {
+Preferences ReadPreferences(const PresetText& text, std::vector<Sentence>& complaints) {
     return Reader(text, complaints).Read();
 }
 

@@ -4,14 +4,14 @@
 
 #include "host/convert/Preferences.h"
 #include "host/presets/PresetText.h"
+#include "host/sentence/Sentence.h"
 
-#include <string>
 #include <vector>
 
 namespace movieconv {
 
 /// Throws PresetError when a member has a value that makes no sense; adds unknown ones to `complaints`.
-Preferences ReadPreferences(const PresetText& text, std::vector<std::string>& complaints);
+Preferences ReadPreferences(const PresetText& text, std::vector<Sentence>& complaints);
 
 /// The members of `child`, and of `parent` where the child has none; null takes a member away. Those of
 /// "video", "audio" and, by codec, "quality" are counted singly. A rate takes the parent's quality away and

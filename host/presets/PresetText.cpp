@@ -1,6 +1,7 @@
 #include "host/presets/PresetText.h"
 
 #include "host/presets/Preset.h"
+#include "host/sentence/Say.h"
 
 #include <algorithm>
 #include <cerrno>
@@ -69,7 +70,7 @@ public:
     bool key(string_t& key) override {
         key_ = key;
         if (!lines_.try_emplace(Path() + "/" + key, line_).second)
-            throw PresetError(fmt::format("{}:{}: \"{}\" is there twice", where_, line_, key));
+            throw PresetError(Say("{}: \"{}\" is there twice", Place(), key));
         return true;
     }
 
@@ -78,15 +79,16 @@ public:
         const std::string text = error.what();
         const std::size_t column = text.find("column ");
         const std::size_t colon = text.find(": ", column == std::string::npos ? 0 : column);
-        throw PresetError(fmt::format("{}:{}: this is no JSON: {}", where_, line_,
-                                      colon == std::string::npos ? text : text.substr(colon + 2)));
+        throw PresetError(Say("{}: this is no JSON: {}", Place(),
+                              colon == std::string::npos ? text : text.substr(colon + 2)));
     }
 
 private:
+    std::string Place() const { return fmt::format("{}:{}", where_, line_); }
     /// What copies or prints values goes as deep as they are nested.
     bool Enter() {
         if (path_.size() == kDeepest)
-            throw PresetError(fmt::format("{}:{}: this is nested too deep for a preset", where_, line_));
+            throw PresetError(Say("{}: this is nested too deep for a preset", Place()));
         path_.push_back(std::exchange(key_, ""));
         return true;
     }
@@ -123,13 +125,13 @@ PresetText ParsePresetText(const std::string& text, const std::string& where) {
                     &collector);
     parsed.json = Json::parse(text);
     if (!parsed.json.is_object())
-        throw PresetError(fmt::format("{}:1: a preset is a JSON object, in braces", where));
+        throw PresetError(Say("{}:1: a preset is a JSON object, in braces", where));
     return parsed;
 }
 
 PresetText ReadPresetFile(const std::string& path) {
     const auto fail = [&] {
-        throw PresetError(fmt::format("cannot read the preset \"{}\": {}", path, std::strerror(errno)));
+        throw PresetError(Say("cannot read the preset \"{}\": {}", path, std::strerror(errno)));
     };
     const std::unique_ptr<std::FILE, int (*)(std::FILE*)> file(std::fopen(path.c_str(), "rbe"), std::fclose);
     if (!file)
@@ -139,7 +141,7 @@ PresetText ReadPresetFile(const std::string& path) {
     if (std::ferror(file.get()) != 0)
         fail();
     if (text.size() > kMostBytes)
-        throw PresetError(fmt::format("\"{}\" is too large for a preset", path));
+        throw PresetError(Say("\"{}\" is too large for a preset", path));
     return ParsePresetText(text, path);
 }
 

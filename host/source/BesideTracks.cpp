@@ -1,5 +1,6 @@
 #include "host/source/BesideTracks.h"
 
+#include "host/sentence/Say.h"
 #include "host/source/Charset.h"
 #include "host/source/EarlierCues.h"
 #include "host/source/MediaTime.h"
@@ -116,18 +117,19 @@ bool BesideTracks::Copies(int stream) const {
     return std::find(copied_.begin(), copied_.end(), stream) != copied_.end();
 }
 
-std::vector<std::string> BesideTracks::Complaints() const {
-    std::vector<std::string> texts;
+std::vector<Sentence> BesideTracks::Complaints() const {
+    std::vector<Sentence> texts;
     if (const int64_t cues = cuesInOtherCharset_; cues > 0)
-        texts.push_back(fmt::format("{} of its subtitles {} not in UTF-8 and taken for Windows-1252", cues,
-                                    cues == 1 ? "was" : "were"));
+        texts.push_back(cues == 1
+                            ? Say("1 of its subtitles was not in UTF-8 and taken for Windows-1252")
+                            : Say("{} of its subtitles were not in UTF-8 and taken for Windows-1252", cues));
     for (const BesideSound* sound : sounds_) {
         if (sound->Damaged() > 0)
-            texts.push_back(fmt::format("{} damaged pieces of sound data were skipped in stream {}",
-                                        sound->Damaged(), sound->Stream()));
+            texts.push_back(Say("{} damaged pieces of sound data were skipped in stream {}", sound->Damaged(),
+                                sound->Stream()));
         if (sound->Corrections() > 0)
-            texts.push_back(fmt::format("the sound of stream {} had {} gaps or overlaps, which were closed",
-                                        sound->Stream(), sound->Corrections()));
+            texts.push_back(Say("the sound of stream {} had {} gaps or overlaps, which were closed",
+                                sound->Stream(), sound->Corrections()));
     }
     return texts;
 }

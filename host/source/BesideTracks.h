@@ -52,7 +52,7 @@ public:
     bool Copies(int stream) const;
 
     /// As Movie's.
-    std::vector<std::string> Complaints() const;
+    std::vector<Sentence> Complaints() const;
 
 private:
     template <class Track>

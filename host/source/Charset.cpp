@@ -1,10 +1,10 @@
 #include "host/source/Charset.h"
 
 #include "ffmpeg/AvHandles.h"
+#include "host/sentence/Say.h"
 #include "host/source/SourceError.h"
 
 #include <algorithm>
-#include <fmt/format.h>
 #include <iconv.h>
 #include <optional>
 #include <string_view>
@@ -17,7 +17,7 @@ namespace {
 std::optional<std::string> Convert(const std::string& text, const std::string& charset) {
     const iconv_t converter = iconv_open("UTF-8", charset.c_str());
     if (converter == reinterpret_cast<iconv_t>(-1))
-        throw SourceError(fmt::format("there is no character set \"{}\"", charset));
+        throw SourceError(Say("there is no character set \"{}\"", charset));
     std::string converted(text.size() * 4 + 16, '\0');
     std::string from = text;
     char* in = from.data();
@@ -46,7 +46,7 @@ std::string Decoded(std::string text, const std::string& charset) {
     if (!charset.empty()) {
         if (std::optional<std::string> converted = Convert(text, charset))
             return std::move(*converted);
-        throw SourceError(fmt::format("it is not in the character set \"{}\"", charset));
+        throw SourceError(Say("it is not in the character set \"{}\"", charset));
     }
     if (Convert(text, "UTF-8"))
         return text;

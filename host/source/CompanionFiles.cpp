@@ -1,10 +1,10 @@
 #include "host/source/CompanionFiles.h"
 
+#include "host/sentence/Say.h"
 #include "host/source/SourceError.h"
 
 #include <algorithm>
 #include <filesystem>
-#include <fmt/format.h>
 #include <new>
 #include <system_error>
 #include <utility>
@@ -44,25 +44,23 @@ void CompanionFiles::Guard(AVFormatContext& context) {
 }
 
 std::string CompanionFiles::Permit(const std::string& url) const {
-    const auto refuse = [&](const char* reason) {
-        return SourceError(fmt::format("it names \"{}\", {}", url, reason));
-    };
+    const Sentence another = Say("it names \"{}\", another file", url);
     std::error_code failed;
     const std::string path = PathOf(url);
     if (path.empty())
-        throw refuse("which is not a file's name");
+        throw SourceError(Say("it names \"{}\", which is not a file's name", url));
     const fs::path real = fs::canonical(path, failed);
     const fs::path source = failed ? fs::path() : fs::canonical(source_, failed);
     if (failed)
-        throw refuse(allowed_ ? "which does not exist" : "another file");
+        throw SourceError(allowed_ ? Say("it names \"{}\", which does not exist", url) : another);
     if (real == source)
         return real.string();
     if (!allowed_)
-        throw refuse("another file");
+        throw SourceError(another);
     if (!LiesBelow(real, source.parent_path()))
-        throw refuse("which lies outside its folder");
+        throw SourceError(Say("it names \"{}\", which lies outside its folder", url));
     if (!fs::is_regular_file(real, failed))
-        throw refuse("which is no regular file");
+        throw SourceError(Say("it names \"{}\", which is no regular file", url));
     return real.string();
 }
 
@@ -78,18 +76,18 @@ int CompanionFiles::OnOpen(AVFormatContext* context, AVIOContext** io, const cha
             return AVERROR(EACCES);
         const std::string path = self.Permit(url);
         if (!self.repetition_ && ++self.openings_[path] > kMostOpenings)
-            throw SourceError(fmt::format("it names \"{}\" over and over", url));
+            throw SourceError(Say("it names \"{}\" over and over", url));
         auto file = self.Open(path);
         *io = file->Io();
         self.open_[*io] = std::move(file);
         return 0;
     } catch (const SourceError& refusal) {
-        if (self.refusal_.empty())
-            self.refusal_ = refusal.what();
+        if (self.refusal_.IsEmpty())
+            self.refusal_ = refusal.Words();
         return AVERROR(EACCES);
     } catch (const std::system_error& error) {
-        if (self.refusal_.empty())
-            self.refusal_ = fmt::format("it names \"{}\": {}", url, error.code().message());
+        if (self.refusal_.IsEmpty())
+            self.refusal_ = Say("it names \"{}\": {}", url, error.code().message());
         return AVERROR(error.code().value());
     } catch (const std::bad_alloc&) {
         return AVERROR(ENOMEM);

@@ -4,6 +4,7 @@
 #define MOVIECONV_HOST_SOURCE_COMPANIONFILES_H
 
 #include "ffmpeg/AvHandles.h"
+#include "host/sentence/Sentence.h"
 #include "host/source/InputFile.h"
 
 #include <map>
@@ -35,7 +36,7 @@ public:
     void AllowRepetition() { repetition_ = true; }
 
     /// Why the first file that was not permitted was refused; empty when none was.
-    const std::string& Refusal() const { return refusal_; }
+    const Sentence& Refusal() const { return refusal_; }
 
 private:
     static int OnOpen(AVFormatContext* context, AVIOContext** io, const char* url, int flags,
@@ -47,7 +48,7 @@ private:
     const std::shared_ptr<const Interruption> interruption_;
     bool repetition_ = false;
     std::map<std::string, int> openings_; // of each file
-    std::string refusal_;
+    Sentence refusal_;
     std::map<const AVIOContext*, std::unique_ptr<InputFile>> open_;
 };
 

@@ -1,10 +1,10 @@
 #include "host/source/ConcatScript.h"
 
+#include "host/sentence/Say.h"
 #include "host/source/SourceError.h"
 
 #include <algorithm>
 #include <array>
-#include <fmt/format.h>
 #include <string_view>
 #include <system_error>
 
@@ -27,7 +27,7 @@ std::string ReadWhole(InputFile& file) {
            (count = avio_read(file.Io(), part.data(), static_cast<int>(part.size()))) > 0)
         text.append(reinterpret_cast<const char*>(part.data()), static_cast<std::size_t>(count));
     if (static_cast<int64_t>(text.size()) > kLongestScript || avio_seek(file.Io(), 0, SEEK_SET) != 0)
-        throw SourceError("the script is too long or not a file");
+        throw SourceError(Say("the script is too long or not a file"));
     return text;
 }
 
@@ -46,14 +46,14 @@ void CheckName(const std::string& name, const std::string& folder, const Compani
                const char* formats) {
     // In a URL these have a meaning of their own, so that another file would be opened.
     if (name.empty() || name.find_first_of(":?#%\\") != std::string::npos)
-        throw SourceError(fmt::format("it names \"{}\", which is not a plain name", name));
+        throw SourceError(Say("it names \"{}\", which is not a plain name", name));
     const std::string path = companions.Permit(name[0] == '/' ? name : folder + name);
     const std::unique_ptr<InputFile> file = companions.Open(path);
     const AVInputFormat* format = nullptr;
     const int result = av_probe_input_buffer2(file->Io(), &format, path.c_str(), nullptr, 0, 0);
     av::CheckMemory(result);
     if (result < 0 || av_match_list(format->name, formats, ',') == 0)
-        throw SourceError(fmt::format("it names \"{}\", which is not a movie", name));
+        throw SourceError(Say("it names \"{}\", which is not a movie", name));
 }
 
 void CheckLine(std::string_view line, const std::string& folder, const CompanionFiles& companions,
@@ -67,7 +67,7 @@ void CheckLine(std::string_view line, const std::string& folder, const Companion
         const std::size_t name = std::min(line.find_first_not_of(kSpaces, end), line.size());
         CheckName(NameIn(std::string(line.substr(name))), folder, companions, formats);
     } else if (std::find(kHarmless.begin(), kHarmless.end(), keyword) == kHarmless.end()) {
-        throw SourceError(fmt::format("its line \"{}\" is not understood", keyword));
+        throw SourceError(Say("its line \"{}\" is not understood", keyword));
     }
 }
 
@@ -78,7 +78,7 @@ void CheckConcatScript(InputFile& script, const std::string& path, const Compani
     try {
         const std::string folder = path.substr(0, path.rfind('/') + 1);
         if (folder.find_first_of("?#%\\") != std::string::npos)
-            throw SourceError("its folder has a name that scripts cannot lie in");
+            throw SourceError(Say("its folder has a name that scripts cannot lie in"));
         const std::string text = ReadWhole(script);
         for (std::size_t begin = 0; begin < text.size();) {
             const std::size_t end =
@@ -87,9 +87,9 @@ void CheckConcatScript(InputFile& script, const std::string& path, const Compani
             begin = end + 1;
         }
     } catch (const SourceError& refusal) {
-        throw SourceError("cannot open \"" + path + "\": " + refusal.what());
+        throw SourceError(Say("cannot open \"{}\": {}", path, refusal.Words()));
     } catch (const std::system_error& error) {
-        throw SourceError("cannot open \"" + path + "\": a file that it names: " + error.code().message());
+        throw SourceError(Say("cannot open \"{}\": a file that it names: {}", path, error.code().message()));
     }
 }
 

@@ -1,5 +1,6 @@
 #include "host/source/CopiedSound.h"
 
+#include "host/sentence/Say.h"
 #include "host/source/CodedSound.h"
 #include "host/source/SoundBlock.h"
 #include "host/source/SourceError.h"
@@ -40,7 +41,7 @@ public:
         if (result >= 0 && Filter(*packet))
             told = av_packet_get_side_data(packet.get(), AV_PKT_DATA_NEW_EXTRADATA, &size);
         if (told == nullptr)
-            throw SourceError("its sound has no form that could be copied; convert it instead");
+            throw SourceError(Say("its sound has no form that could be copied; convert it instead"));
         parameters.extradata = static_cast<uint8_t*>(av_mallocz(size + AV_INPUT_BUFFER_PADDING_SIZE));
         if (parameters.extradata == nullptr)
             throw std::bad_alloc();
@@ -166,7 +167,8 @@ void CopiedSound::Hold(av::Packet packet) {
     const bool hasHeader = deframer_ && HasAdtsHeader(*packet);
     if ((hasHeader ? deframer_->HasOtherForm(*packet) : DescribesAnew(*packet, *parameters_)) ||
         HasOtherRate(*packet))
-        throw SourceError("its sound changes its form there and cannot be copied on; convert it instead");
+        throw SourceError(
+            Say("its sound changes its form there and cannot be copied on; convert it instead"));
     if (hasHeader && !deframer_->Filter(*packet))
         return;
     av_packet_shrink_side_data(packet.get(), AV_PKT_DATA_NEW_EXTRADATA, 0); // it has been told

@@ -2,6 +2,7 @@
 
 #include "ffmpeg/FilterGraph.h"
 #include "ffmpeg/FilterLibrary.h"
+#include "host/sentence/Say.h"
 #include "host/source/StreamDecoder.h"
 
 #include <algorithm>
@@ -103,7 +104,7 @@ std::optional<Crop> FindBorders(Source& source) {
                 borders = Found(*seen);
         }
     } catch (const av::FilterError& error) {
-        throw SourceError(std::string("its borders cannot be looked for: ") + error.what());
+        throw SourceError(Say("its borders cannot be looked for: {}", WordsOf(error)));
     }
     return borders ? std::optional(Upright(*borders, pictures)) : std::nullopt;
 }

@@ -1,5 +1,6 @@
 #include "host/source/CueList.h"
 
+#include "host/sentence/Say.h"
 #include "host/source/Charset.h"
 #include "host/source/MediaTime.h"
 #include "host/source/PacketClock.h"
@@ -9,7 +10,6 @@
 #include "host/source/SubtitleFile.h"
 
 #include <algorithm>
-#include <fmt/format.h>
 #include <memory>
 #include <utility>
 
@@ -21,7 +21,7 @@ constexpr int64_t kLongestCue = 24LL * 60 * 60 * kTicksPerSecond;
 
 void CheckDecodable(const AVCodecParameters& parameters, const BurnWish& wish) {
     if (avcodec_find_decoder(parameters.codec_id) == nullptr)
-        throw TrackError(fmt::format("the subtitles \"{}\" cannot be decoded", wish.what));
+        throw TrackError(Say("the subtitles \"{}\" cannot be decoded", wish.what));
 }
 
 void Add(CueList& list, av::Packet packet, int64_t begin, int64_t duration) {
@@ -49,10 +49,10 @@ void ReadStream(CueList& list, const Source& source, const BurnWish& wish, bool 
     const int stream = WantedTracks(source.Info().streams, StreamKind::kSubtitles, {{wish.what}}).front();
     MovieReader reader(source.Info().path, playlists, Growth::kRead, source.Reader().Interruptible());
     if (!reader.IsSeekable())
-        throw TrackError("the subtitles of a pipe cannot be drawn into its pictures");
+        throw TrackError(Say("the subtitles of a pipe cannot be drawn into its pictures"));
     AVFormatContext* context = reader.Context();
     if (stream >= static_cast<int>(context->nb_streams))
-        throw TrackError(fmt::format("the subtitles {} are not there any more", stream));
+        throw TrackError(Say("the subtitles {} are not there any more", stream));
     const AVStream& found = *context->streams[stream];
     CheckDecodable(*found.codecpar, wish);
     list.parameters = av::CopyOf(*found.codecpar);
@@ -63,7 +63,7 @@ void ReadStream(CueList& list, const Source& source, const BurnWish& wish, bool 
         const int64_t from = reader.Start() + wish.begin - kFarthest;
         const int64_t target = av_rescale_q(from, {1, kTicksPerSecond}, av_get_time_base_q());
         if (avformat_seek_file(context, -1, INT64_MIN, target, target, 0) < 0 && !reader.Rewind())
-            throw TrackError("the subtitles cannot be read ahead of the pictures");
+            throw TrackError(Say("the subtitles cannot be read ahead of the pictures"));
     }
     for (bool ended = false; !ended;) {
         av::Packet read = av::NewPacket();
@@ -96,7 +96,7 @@ void ReadFile(CueList& list, const Source& source, const BurnWish& wish) {
     } catch (const TrackError&) {
         throw;
     } catch (const SourceError& error) {
-        throw TrackError(error.what());
+        throw TrackError(error.Words());
     }
 }
 
@@ -114,7 +114,7 @@ av::CodecContext CueList::OpenDecoder(AVRational timeBase) const {
     const int result = avcodec_open2(decoder.get(), decoder->codec, nullptr);
     av::CheckMemory(result);
     if (result < 0)
-        throw TrackError("the subtitles cannot be decoded: " + av::ErrorText(result));
+        throw TrackError(Say("the subtitles cannot be decoded: {}", Sentence(av::ErrorText(result))));
     return decoder;
 }
 

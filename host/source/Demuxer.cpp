@@ -1,5 +1,6 @@
 #include "host/source/Demuxer.h"
 
+#include "host/sentence/Say.h"
 #include "host/source/MediaTime.h"
 #include "host/source/PacketTime.h"
 
@@ -52,7 +53,7 @@ bool Demuxer::Seek(double seconds) {
     soughtSeconds_ = seconds;
     soughtWell_ = seeker_.Seek(seconds);
     if (!soughtWell_ && seeker_.HasMoved())
-        failures_.Note("it cannot be read from its start again");
+        failures_.Note(Say("it cannot be read from its start again"));
     return soughtWell_;
 }
 
@@ -185,7 +186,8 @@ bool Demuxer::ReadOne() {
     if (result < 0) {
         const std::lock_guard lock(mutex_);
         if (!stopping_)
-            failures_.Note(result != AVERROR_EOF ? av::ErrorText(result) : source_.Reader().File().Refusal());
+            failures_.Note(result != AVERROR_EOF ? Sentence(av::ErrorText(result))
+                                                 : source_.Reader().File().Refusal());
         return false;
     }
     failedReads_ = 0;

@@ -1,5 +1,7 @@
 #include "host/source/Failures.h"
 
+#include "host/sentence/Say.h"
+
 #include <new>
 #include <system_error>
 #include <utility>
@@ -8,9 +10,9 @@ namespace movieconv {
 namespace {
 
 /// Writes what went wrong into `reason`, which stays as it is when there is no memory for it.
-void Describe(const std::exception& error, std::string& reason) noexcept {
+void Describe(const std::exception& error, Sentence& reason) noexcept {
     try {
-        reason = error.what();
+        reason = WordsOf(error);
     } catch (const std::bad_alloc&) {
     }
 }
@@ -21,23 +23,23 @@ std::thread NewThread(std::function<void()> work) {
     try {
         return std::thread(std::move(work));
     } catch (const std::system_error& error) {
-        throw ThreadError(std::string("no thread can be started: ") + error.what());
+        throw ThreadError(Say("no thread can be started: {}", error.what()));
     }
 }
 
-void Failures::Note(std::string reason) noexcept {
+void Failures::Note(Sentence reason) noexcept {
     const std::lock_guard lock(mutex_);
-    if (first_.empty())
+    if (first_.IsEmpty())
         first_ = std::move(reason);
 }
 
-std::string Failures::First() const {
+Sentence Failures::First() const {
     const std::lock_guard lock(mutex_);
     return first_;
 }
 
 void Failures::Enter(const std::exception_ptr& failure) noexcept {
-    std::string reason = "no memory"; // short enough to need none
+    Sentence reason = Say("no memory"); // short enough to need none
     try {
         std::rethrow_exception(failure);
     } catch (const std::bad_alloc&) {

@@ -3,19 +3,19 @@
 #ifndef MOVIECONV_HOST_SOURCE_FAILURES_H
 #define MOVIECONV_HOST_SOURCE_FAILURES_H
 
+#include "host/sentence/SentenceError.h"
+
 #include <exception>
 #include <functional>
 #include <mutex>
-#include <stdexcept>
-#include <string>
 #include <thread>
 
 namespace movieconv {
 
 /// There is no thread to be had.
-class ThreadError : public std::runtime_error {
+class ThreadError : public SentenceError {
 public:
-    using std::runtime_error::runtime_error;
+    using SentenceError::SentenceError;
 };
 
 /// A thread that does the work. Throws ThreadError.
@@ -40,17 +40,17 @@ public:
     }
 
     /// Notes a reason unless there is one.
-    void Note(std::string reason) noexcept;
+    void Note(Sentence reason) noexcept;
 
     /// The first reason, empty without one.
-    std::string First() const;
+    Sentence First() const;
 
 private:
     void Enter(const std::exception_ptr& failure) noexcept;
 
     const std::function<void()> stop_;
     mutable std::mutex mutex_;
-    std::string first_;
+    Sentence first_;
 };
 
 } // namespace movieconv

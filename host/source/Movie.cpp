@@ -1,10 +1,10 @@
 #include "host/source/Movie.h"
 
+#include "host/sentence/Say.h"
 #include "host/source/MediaTime.h"
 #include "host/source/PictureLosses.h"
 #include "host/source/SourceError.h"
 
-#include <fmt/format.h>
 #include <utility>
 
 namespace movieconv {
@@ -14,8 +14,18 @@ std::unique_ptr<SubtitleBurner> MakeBurner(const Source& source, const SourceCho
     if (!choice.burn || choice.stampsOnly)
         return nullptr;
     if (source.PictureStream() == nullptr)
-        throw TrackError("there are no pictures to draw subtitles into");
+        throw TrackError(Say("there are no pictures to draw subtitles into"));
     return std::make_unique<SubtitleBurner>(source, choice);
+}
+
+Sentence TellLate(const LateStreams::Left& left) {
+    const double length = ToSeconds(left.end - left.begin);
+    const double begin = ToSeconds(left.begin);
+    return left.kind == StreamKind::kPictures
+               ? Say("pictures of {:.0f} s, which the source announces only at {:.0f} s, were left out",
+                     length, begin)
+               : Say("sound of {:.0f} s, which the source announces only at {:.0f} s, was left out", length,
+                     begin);
 }
 
 } // namespace
@@ -83,36 +93,31 @@ std::optional<Shortfall> Movie::LateShortfall(const Reached& ends) const {
     return found;
 }
 
-std::vector<std::string> Movie::Complaints() const {
-    std::vector<std::string> texts;
+std::vector<Sentence> Movie::Complaints() const {
+    std::vector<Sentence> texts;
     if (pictures_)
-        for (std::string& loss : PictureLosses(*Info().pictures, choice_, *pictures_))
+        for (Sentence& loss : PictureLosses(*Info().pictures, choice_, *pictures_))
             texts.push_back(std::move(loss));
     for (const LateStreams::Left& left : demuxer_.LeftOut())
-        texts.push_back(fmt::format(
-            "{} of {:.0f} s, which the source announces only at {:.0f} s, {} left out",
-            left.kind == StreamKind::kPictures ? "pictures" : "sound", ToSeconds(left.end - left.begin),
-            ToSeconds(left.begin), left.kind == StreamKind::kPictures ? "were" : "was"));
+        texts.push_back(TellLate(left));
     if (const int jumps = demuxer_.ClockJumps(); jumps > 0) {
-        texts.push_back(fmt::format("the source's clock jumped {}; the parts were joined",
-                                    jumps == 1 ? "once" : fmt::format("{} times", jumps)));
+        texts.push_back(jumps == 1 ? Say("the source's clock jumped once; the parts were joined")
+                                   : Say("the source's clock jumped {} times; the parts were joined", jumps));
     }
     if (pictures_ && pictures_->Damaged() > 0)
-        texts.push_back(fmt::format("{} damaged pieces of picture data were skipped", pictures_->Damaged()));
+        texts.push_back(Say("{} damaged pieces of picture data were skipped", pictures_->Damaged()));
     if (pictures_ && pictures_->Repaired() > 0) {
-        texts.push_back(
-            fmt::format("{} pictures had a missing or falling time stamp", pictures_->Repaired()));
+        texts.push_back(Say("{} pictures had a missing or falling time stamp", pictures_->Repaired()));
     }
     if (sound_ && sound_->Damaged() > 0)
-        texts.push_back(fmt::format("{} damaged pieces of sound data were skipped", sound_->Damaged()));
+        texts.push_back(Say("{} damaged pieces of sound data were skipped", sound_->Damaged()));
     if (sound_ && sound_->Corrections() > 0) {
-        texts.push_back(
-            fmt::format("the sound had {} gaps or overlaps, which were closed", sound_->Corrections()));
+        texts.push_back(Say("the sound had {} gaps or overlaps, which were closed", sound_->Corrections()));
     }
     if (sound_ && !beside_.Copies(Info().sound->index) && sound_->Channels() > Info().sound->channels)
-        texts.push_back(fmt::format("some of its sound has {} channels and got {}", sound_->Channels(),
-                                    Info().sound->channels));
-    for (std::string& text : beside_.Complaints())
+        texts.push_back(
+            Say("some of its sound has {} channels and got {}", sound_->Channels(), Info().sound->channels));
+    for (Sentence& text : beside_.Complaints())
         texts.push_back(std::move(text));
     return texts;
 }

@@ -60,7 +60,7 @@ public:
     double SoundSeconds() const { return sound_ ? sound_->SecondsDelivered() : 0; }
 
     /// Why reading ended before the end of the source; empty when it did not. Any thread.
-    std::string ReadError() const { return failures_.First(); }
+    Sentence ReadError() const { return failures_.First(); }
 
     /// What the source promises and does not hold, of the streams that were taken to their end; nothing when
     /// it holds all. Once both streams ended.
@@ -79,7 +79,7 @@ public:
 
     /// What was wrong with the movie and has been put right or skipped, a sentence each. Once both streams
     /// ended.
-    std::vector<std::string> Complaints() const;
+    std::vector<Sentence> Complaints() const;
 
 private:
     std::optional<Shortfall> LateShortfall(const Reached& ends) const;

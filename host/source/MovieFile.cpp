@@ -1,5 +1,6 @@
 #include "host/source/MovieFile.h"
 
+#include "host/sentence/Say.h"
 #include "host/source/ConcatScript.h"
 #include "host/source/SourceError.h"
 
@@ -28,15 +29,16 @@ int WasInterrupted(void* interruption) {
     return static_cast<const Interruption*>(interruption)->Interrupted() ? 1 : 0;
 }
 
-std::string CannotOpen(const std::string& path, const std::string& reason) {
-    return "cannot open \"" + path + "\": " + reason;
+Sentence CannotOpen(const std::string& path, const Sentence& reason) {
+    return Say("cannot open \"{}\": {}", path, reason);
 }
 
 /// For want of memory too: how much is asked for is written in the file.
-std::string ReasonOf(int error) {
+Sentence ReasonOf(int error) {
     if (error == AVERROR_INVALIDDATA)
-        return "it is not a movie, or its index is missing because it was never finished";
-    return error == AVERROR(ENOMEM) ? "it asks for more memory than there is" : av::ErrorText(error);
+        return Say("it is not a movie, or its index is missing because it was never finished");
+    return error == AVERROR(ENOMEM) ? Say("it asks for more memory than there is")
+                                    : Sentence(av::ErrorText(error));
 }
 
 } // namespace
@@ -63,12 +65,12 @@ const AVInputFormat& MovieFile::Recognise(const std::string& url, bool playlists
     if (result < 0)
         throw SourceError(CannotOpen(path_, ReasonOf(result)));
     if (av_match_name("tty", format->name) != 0) // which draws letters as pictures
-        throw SourceError(CannotOpen(path_, "it is a text, not a movie"));
+        throw SourceError(CannotOpen(path_, Say("it is a text, not a movie")));
     if (IsOneOf(*format, kPlaylists)) {
         if (!IsOneOf(*format, kFollowed))
-            throw SourceError(CannotOpen(path_, "it is not a movie, but says where to find one"));
+            throw SourceError(CannotOpen(path_, Say("it is not a movie, but says where to find one")));
         if (!playlists)
-            throw PlaylistError(CannotOpen(path_, "it is a playlist, which names other files"));
+            throw PlaylistError(CannotOpen(path_, Say("it is a playlist, which names other files")));
     }
     return *format;
 }
@@ -78,12 +80,12 @@ void MovieFile::Open(const std::string& url, const AVInputFormat& format) {
     if (result >= 0 && MayHoldMore() && avio_seek(bytes_.Io(), 0, SEEK_SET) == 0)
         result = TryToOpen(url, format, true);
     companions_.AllowRepetition();
-    if (!companions_.Refusal().empty())
+    if (!companions_.Refusal().IsEmpty())
         throw SourceError(CannotOpen(path_, companions_.Refusal()));
     if (result < 0 && !input_)
         throw SourceError(CannotOpen(path_, ReasonOf(result)));
     if (result < 0)
-        throw SourceError("cannot read the streams of \"" + path_ + "\": " + ReasonOf(result));
+        throw SourceError(Say("cannot read the streams of \"{}\": {}", path_, ReasonOf(result)));
 }
 
 /// `patiently`: also when a stream begins late. An AVERROR below 0; without an input when it cannot be

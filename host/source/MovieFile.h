@@ -42,7 +42,7 @@ public:
     ContainerNotes Notes() const { return ReadContainerNotes(bytes_, *input_); }
 
     /// Why a file that the source names was not read; empty when all were.
-    const std::string& Refusal() const { return companions_.Refusal(); }
+    const Sentence& Refusal() const { return companions_.Refusal(); }
 
 private:
     const AVInputFormat& Recognise(const std::string& url, bool playlists);

@@ -1,5 +1,6 @@
 #include "host/source/MovieReader.h"
 
+#include "host/sentence/Say.h"
 #include "host/source/MediaTime.h"
 #include "host/source/SourceError.h"
 
@@ -103,7 +104,7 @@ void MovieReader::Reopen() {
         for (const int stream : *streams)
             last = std::max(last, stream);
     if (last >= static_cast<int>(again->Context()->nb_streams))
-        throw SourceError("\"" + path_ + "\" has changed meanwhile");
+        throw SourceError(Say("\"{}\" has changed meanwhile", path_));
     file_ = std::move(again);
     DiscardOthers();
 }

@@ -1,13 +1,13 @@
 #include "host/source/PictureFilter.h"
 
 #include "ffmpeg/FilterLibrary.h"
+#include "host/sentence/Say.h"
 #include "host/source/SourceError.h"
 
 extern "C" {
 #include <libavutil/pixdesc.h>
 }
 
-#include <fmt/format.h>
 #include <string>
 
 namespace movieconv {
@@ -26,10 +26,9 @@ void Filtering(Work work, const char* matrix) {
     } catch (const av::FilterError& error) {
         throw SourceError(
             matrix == nullptr
-                ? fmt::format("its pictures cannot be filtered: {}", error.what())
-                : fmt::format("its HDR pictures with the colour matrix \"{}\" cannot be brought to "
-                              "BT.709: {}",
-                              matrix, error.what()));
+                ? Say("its pictures cannot be filtered: {}", WordsOf(error))
+                : Say("its HDR pictures with the colour matrix \"{}\" cannot be brought to BT.709: {}",
+                      matrix, WordsOf(error)));
     }
 }
 

@@ -1,6 +1,6 @@
 #include "host/source/PictureLosses.h"
 
-#include <fmt/format.h>
+#include "host/sentence/Say.h"
 
 namespace movieconv {
 namespace {
@@ -8,46 +8,46 @@ namespace {
 constexpr int kMostDepth = 10; // of what is handed out
 
 void AddLossesOfLight(const PictureStreamInfo& pictures, const SourceChoice& choice,
-                      std::vector<std::string>& texts) {
+                      std::vector<Sentence>& texts) {
     if (IsHdr(pictures) && !choice.keepHdr)
-        texts.emplace_back("its HDR pictures were brought to the light and colours of BT.709");
+        texts.push_back(Say("its HDR pictures were brought to the light and colours of BT.709"));
     else if (pictures.depth > 8 && !choice.deep)
-        texts.push_back(fmt::format("its pictures of {} bits got 8", pictures.depth));
+        texts.push_back(Say("its pictures of {} bits got 8", pictures.depth));
     else if (pictures.depth > kMostDepth)
-        texts.push_back(fmt::format("its pictures of {} bits got 10", pictures.depth));
+        texts.push_back(Say("its pictures of {} bits got 10", pictures.depth));
     if (pictures.dolbyVisionAlone)
-        texts.emplace_back("its colours are made for Dolby Vision alone, and are wrong without it");
+        texts.push_back(Say("its colours are made for Dolby Vision alone, and are wrong without it"));
     else if (pictures.dolbyVision)
-        texts.emplace_back("what Dolby Vision adds to its pictures was left out");
+        texts.push_back(Say("what Dolby Vision adds to its pictures was left out"));
 }
 
 } // namespace
 
-std::vector<std::string> PictureLosses(const PictureStreamInfo& pictures, const SourceChoice& choice,
-                                       const PictureDecoder& decoder) {
-    std::vector<std::string> texts;
+std::vector<Sentence> PictureLosses(const PictureStreamInfo& pictures, const SourceChoice& choice,
+                                    const PictureDecoder& decoder) {
+    std::vector<Sentence> texts;
     if (decoder.Deinterlaced())
-        texts.emplace_back("interlaced pictures were made progressive");
+        texts.push_back(Say("interlaced pictures were made progressive"));
     if (decoder.LeftInterlaced())
-        texts.emplace_back("interlaced pictures stayed as they are, in files that do not tell it");
+        texts.push_back(Say("interlaced pictures stayed as they are, in files that do not tell it"));
     AddLossesOfLight(pictures, choice, texts);
     if (!pictures.fineColours.empty())
-        texts.push_back(fmt::format("its {} pictures keep their colours at half the resolution (4:2:0)",
-                                    pictures.fineColours));
+        texts.push_back(
+            Say("its {} pictures keep their colours at half the resolution (4:2:0)", pictures.fineColours));
     if (pictures.transparent)
-        texts.emplace_back("the transparency of its pictures was left out");
+        texts.push_back(Say("the transparency of its pictures was left out"));
     const PictureNotes& notes = decoder.Notes();
     const int width = pictures.width + pictures.crop.left + pictures.crop.right;
     const int height = pictures.height + pictures.crop.top + pictures.crop.bottom;
     if (int64_t{notes.Width()} * notes.Height() > int64_t{width} * height)
-        texts.push_back(fmt::format("some of its pictures have {}x{} and were fitted into those of {}x{}",
-                                    notes.Width(), notes.Height(), pictures.width, pictures.height));
+        texts.push_back(Say("some of its pictures have {}x{} and were fitted into those of {}x{}",
+                            notes.Width(), notes.Height(), pictures.width, pictures.height));
     if (notes.Captioned())
-        texts.emplace_back("its closed captions were left out");
+        texts.push_back(Say("its closed captions were left out"));
     if (pictures.stereoscopic || notes.Stereoscopic())
-        texts.emplace_back("pictures for both eyes stayed as they are, in files that do not tell it");
+        texts.push_back(Say("pictures for both eyes stayed as they are, in files that do not tell it"));
     if (pictures.spherical)
-        texts.emplace_back("spherical pictures stayed as they are, in files that do not tell it");
+        texts.push_back(Say("spherical pictures stayed as they are, in files that do not tell it"));
     return texts;
 }
 

@@ -11,8 +11,8 @@ namespace movieconv {
 
 /// For people, each the end of a sentence: "the transparency of its pictures was left out". Of the pictures
 /// that `decoder` has given so far.
-std::vector<std::string> PictureLosses(const PictureStreamInfo& pictures, const SourceChoice& choice,
-                                       const PictureDecoder& decoder);
+std::vector<Sentence> PictureLosses(const PictureStreamInfo& pictures, const SourceChoice& choice,
+                                    const PictureDecoder& decoder);
 
 } // namespace movieconv
 

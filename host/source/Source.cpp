@@ -1,23 +1,23 @@
 #include "host/source/Source.h"
 
+#include "host/sentence/Say.h"
 #include "host/source/Probe.h"
 #include "host/source/SourceTexts.h"
 #include "host/source/StreamChoice.h"
 #include "host/source/StreamDescription.h"
 
 #include <cstddef>
-#include <fmt/format.h>
 #include <utility>
 #include <vector>
 
 namespace movieconv {
 namespace {
 
-std::string NothingToConvert(const std::string& path, const SourceChoice& choice) {
-    return fmt::format("\"{}\" holds no {} that can be decoded", path,
-                       choice.pictures && choice.sound ? "pictures and no sound"
-                       : choice.pictures               ? "pictures"
-                                                       : "sound");
+Sentence NothingToConvert(const std::string& path, const SourceChoice& choice) {
+    if (choice.pictures && choice.sound)
+        return Say("\"{}\" holds no pictures and no sound that can be decoded", path);
+    return choice.pictures ? Say("\"{}\" holds no pictures that can be decoded", path)
+                           : Say("\"{}\" holds no sound that can be decoded", path);
 }
 
 } // namespace
@@ -66,8 +66,8 @@ void Source::CropPictures(const Crop& crop) {
     const int width = pictures.width - pictures.crop.left - pictures.crop.right;
     const int height = pictures.height - pictures.crop.top - pictures.crop.bottom;
     if (!crop.CutsNothing() && (width < kLeast || height < kLeast)) {
-        throw CropError(fmt::format("too little is left of the pictures of \"{}\", which are {}x{}",
-                                    info_.path, pictures.width, pictures.height));
+        throw CropError(Say("too little is left of the pictures of \"{}\", which are {}x{}", info_.path,
+                            pictures.width, pictures.height));
     }
     pictures.width = width;
     pictures.height = height;

@@ -2,15 +2,15 @@
 #ifndef MOVIECONV_HOST_SOURCE_SOURCEERROR_H
 #define MOVIECONV_HOST_SOURCE_SOURCEERROR_H
 
-#include <stdexcept>
+#include "host/sentence/SentenceError.h"
 
 namespace movieconv {
 
 /// The source cannot be opened or holds nothing that can be converted. The text names the file and the
 /// reason.
-class SourceError : public std::runtime_error {
+class SourceError : public SentenceError {
 public:
-    using std::runtime_error::runtime_error;
+    using SentenceError::SentenceError;
 };
 
 /// The source names other files, and nobody has allowed them to be read.

@@ -1,5 +1,6 @@
 #include "host/source/StreamChoice.h"
 
+#include "host/sentence/Say.h"
 #include "host/source/Languages.h"
 #include "host/source/SourceError.h"
 
@@ -43,13 +44,13 @@ int Best(const std::vector<StreamInfo>& streams, Fits fits, Rank rank) {
     return best != nullptr ? best->index : -1;
 }
 
-std::string ListOf(const std::vector<StreamInfo>& streams, StreamKind kind) {
+Sentence ListOf(const std::vector<StreamInfo>& streams, StreamKind kind) {
     std::string list;
     for (const StreamInfo& stream : streams)
         if (stream.kind == kind)
             list += fmt::format("{}{}{}", list.empty() ? "" : ", ", stream.index,
                                 stream.language.empty() ? "" : " (" + stream.language + ")");
-    return list.empty() ? "none" : list;
+    return list.empty() ? Say("none") : Sentence(Sentence::Kind::kName, list);
 }
 
 bool IsNumber(const std::string& text) {
@@ -81,10 +82,10 @@ std::vector<int> WantedTracks(const std::vector<StreamInfo>& streams, StreamKind
         missing.erase(std::remove_if(missing.begin(), missing.end(), isMeant), missing.end());
     }
     if (!missing.empty())
-        throw TrackError(fmt::format("there {} no {} \"{}\"; there {}: {}",
-                                     kind == StreamKind::kSound ? "is" : "are",
-                                     kind == StreamKind::kSound ? "sound" : "subtitles", missing.front(),
-                                     kind == StreamKind::kSound ? "is" : "are", ListOf(streams, kind)));
+        throw TrackError(kind == StreamKind::kSound ? Say("there is no sound \"{}\"; there is: {}",
+                                                          missing.front(), ListOf(streams, kind))
+                                                    : Say("there are no subtitles \"{}\"; there are: {}",
+                                                          missing.front(), ListOf(streams, kind)));
     return found;
 }
 

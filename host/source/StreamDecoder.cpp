@@ -1,5 +1,6 @@
 #include "host/source/StreamDecoder.h"
 
+#include "host/sentence/Say.h"
 #include "host/source/SourceError.h"
 
 namespace movieconv {
@@ -13,8 +14,8 @@ StreamDecoder::StreamDecoder(const AVCodecParameters& parameters, AVRational tim
     const int result = avcodec_open2(context_.get(), context_->codec, nullptr);
     av::CheckMemory(result);
     if (result < 0) {
-        throw SourceError(std::string("cannot start the decoder ") + avcodec_get_name(parameters.codec_id) +
-                          ": " + av::ErrorText(result));
+        throw SourceError(Say("cannot start the decoder {}: {}", avcodec_get_name(parameters.codec_id),
+                              Sentence(av::ErrorText(result))));
     }
 }
 

@@ -1,5 +1,6 @@
 #include "host/source/Stretch.h"
 
+#include "host/sentence/Say.h"
 #include "host/source/MediaTime.h"
 #include "host/source/PacketTime.h"
 #include "host/source/SourceError.h"
@@ -52,7 +53,7 @@ Stretch ReadStretch(MovieReader& reader, int counted, int64_t mostBytes, int mos
 
 void ReturnToBegin(MovieReader& reader, const SourceInfo& info) {
     if (!reader.Rewind())
-        throw SourceError("cannot read \"" + info.path + "\" from its start again");
+        throw SourceError(Say("cannot read \"{}\" from its start again", info.path));
 }
 
 } // namespace movieconv

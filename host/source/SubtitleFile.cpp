@@ -1,5 +1,6 @@
 #include "host/source/SubtitleFile.h"
 
+#include "host/sentence/Say.h"
 #include "host/source/Charset.h"
 #include "host/source/InputFile.h"
 #include "host/source/SourceError.h"
@@ -7,7 +8,6 @@
 #include <algorithm>
 #include <cerrno>
 #include <cstdio>
-#include <fmt/format.h>
 #include <new>
 #include <system_error>
 #include <utility>
@@ -31,12 +31,12 @@ std::string ReadWhole(const std::string& path, const std::shared_ptr<const Inter
         while (text.size() <= kMost && (count = avio_read(file.Io(), part.data(), kPart)) > 0)
             text.append(reinterpret_cast<const char*>(part.data()), static_cast<std::size_t>(count));
         if (text.size() > kMost)
-            throw SourceError("it is too large for subtitles");
+            throw SourceError(Say("it is too large for subtitles"));
         if (file.Io()->error < 0)
-            throw SourceError(av::ErrorText(file.Io()->error));
+            throw SourceError(Sentence(av::ErrorText(file.Io()->error)));
         return text;
     } catch (const std::system_error& error) {
-        throw SourceError(fmt::format("cannot open \"{}\": {}", path, error.code().message()));
+        throw SourceError(Say("cannot open \"{}\": {}", path, error.code().message()));
     }
 }
 
@@ -44,13 +44,13 @@ std::string ReadWhole(const std::string& path, const std::shared_ptr<const Inter
 
 SubtitleFile::SubtitleFile(const std::string& path, const std::string& charset,
                            const std::shared_ptr<const Interruption>& interruption) {
-    const auto refuse = [&](const std::string& reason) {
-        throw SourceError(fmt::format("cannot read subtitles from \"{}\": {}", path, reason));
+    const auto refuse = [&](const Sentence& reason) {
+        throw SourceError(Say("cannot read subtitles from \"{}\": {}", path, reason));
     };
     try {
         text_ = Decoded(ReadWhole(path, interruption), charset);
     } catch (const SourceError& error) {
-        refuse(error.what());
+        refuse(error.Words());
     }
     constexpr int kBuffer = 4096;
     io_ = av::NewIo(kBuffer, false, this, Read, nullptr, Seek);
@@ -65,10 +65,10 @@ SubtitleFile::SubtitleFile(const std::string& path, const std::string& charset,
     const int result = avformat_open_input(&context, url.c_str(), nullptr, settings.Get());
     av::CheckMemory(result);
     if (result < 0)
-        refuse("it holds none of text");
+        refuse(Say("it holds none of text"));
     input_.reset(context);
     if (context->nb_streams != 1 || context->streams[0]->codecpar->codec_type != AVMEDIA_TYPE_SUBTITLE)
-        refuse("it holds none of text");
+        refuse(Say("it holds none of text"));
 }
 
 av::Packet SubtitleFile::Take() {

@@ -1,5 +1,6 @@
 #include "ffmpeg/FilterGraph.h"
 #include "ffmpeg/FilterLibrary.h"
+#include "host/sentence/Say.h"
 #include "host/source/CueDrawer.h"
 #include "host/source/MediaTime.h"
 #include "host/source/SourceError.h"
@@ -56,7 +57,7 @@ private:
         if (!error && mkdtemp(path.data()) == nullptr)
             error = {errno, std::generic_category()};
         if (error)
-            throw ScratchError(fmt::format("cannot make a folder for the subtitles: {}", error.message()));
+            throw ScratchError(Say("cannot make a folder for the subtitles: {}", error.message()));
         return path;
     }
 
@@ -69,7 +70,7 @@ private:
         std::ofstream file(path_ + "/" + name, std::ios::binary);
         file.write(static_cast<const char*>(data), static_cast<std::streamsize>(size));
         if (!file.flush())
-            throw ScratchError(fmt::format("cannot write the subtitles to \"{}\"", path_));
+            throw ScratchError(Say("cannot write the subtitles to \"{}\"", path_));
     }
 
     const std::string path_;
@@ -228,7 +229,7 @@ private:
         try {
             work();
         } catch (const av::FilterError& error) {
-            throw SourceError(std::string("the subtitles cannot be drawn: ") + error.what());
+            throw SourceError(Say("the subtitles cannot be drawn: {}", WordsOf(error)));
         }
     }
 

@@ -21,6 +21,8 @@ const char* AdviceFor(Reason reason) {
         return "; --resume goes on with it, --overwrite makes it anew";
     case Reason::kCannotResume:
         return "; without --resume it is made anew";
+    case Reason::kNoPreset:
+        return "; see \"movieconv --list-presets\"";
     case Reason::kNoMemory:
     case Reason::kOther:
         break;
@@ -58,6 +60,11 @@ ExitCode CodeOf(const Verdict& verdict) {
     return verdict.failure ? CodeOf(verdict.failure->Kind()) : ExitCode::kInternal;
 }
 
+Failure FailureOf(const PresetError& error) {
+    const bool isMissing = dynamic_cast<const NoPresetError*>(&error) != nullptr;
+    return {Category::kRequest, error.Words(), isMissing ? Reason::kNoPreset : Reason::kOther};
+}
+
 std::string Explain(const Failure& failure) {
     if (failure.Why() == Reason::kNoMemory && failure.Text().empty())
         return "there is not enough memory";
@@ -67,9 +74,9 @@ std::string Explain(const Failure& failure) {
 std::string Explain(const Warning& warning) {
     switch (warning.kind) {
     case Warning::Kind::kWaitsForRoom:
-        return warning.text + ", Ctrl-C gives up";
+        return warning.text.Text() + ", Ctrl-C gives up";
     case Warning::Kind::kLeftover:
-        return warning.text + "; the same command with --resume goes on with them";
+        return warning.text.Text() + "; the same command with --resume goes on with them";
     default:
         return warning.text;
     }

@@ -5,6 +5,7 @@
 
 #include "host/convert/Failure.h"
 #include "host/convert/Observer.h"
+#include "host/presets/Preset.h"
 
 #include <string>
 
@@ -22,6 +23,9 @@ enum class ExitCode : int {
 
 ExitCode CodeOf(Category category);
 ExitCode CodeOf(const Verdict& verdict);
+
+/// Of a preset that was asked for.
+Failure FailureOf(const PresetError& error);
 
 /// What to tell the user of the program: with the option or the key that helps.
 std::string Explain(const Failure& failure);

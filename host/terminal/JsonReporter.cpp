@@ -87,7 +87,7 @@ void JsonReporter::LeftBehind(const NotCarried& report) {
                                {"number", report.number ? Json(*report.number) : Json(nullptr)},
                                {"codec", report.codec},
                                {"language", report.language},
-                               {"reason", report.reason}}));
+                               {"reason", report.reason.Text()}}));
 }
 
 void JsonReporter::Warn(const std::string& text, const std::string& input) {

@@ -16,7 +16,7 @@ struct Rule {
 void Require(std::initializer_list<Rule> rules) {
     for (const Rule& rule : rules)
         if (rule.broken)
-            throw Failure(Category::kRequest, rule.message);
+            throw Failure(Category::kRequest, Sentence(rule.message));
 }
 
 bool NeedsInput(Task task) {

@@ -3,6 +3,7 @@
 #include "Common/Image/ImageConvert.h"
 #include "host/convert/Failure.h"
 #include "host/presets/Preset.h"
+#include "host/terminal/ExitCode.h"
 #include "host/terminal/Help.h"
 #include "host/terminal/OptionChecks.h"
 #include "host/terminal/OptionTable.h"
@@ -44,7 +45,7 @@ void ApplyPreset(Options& options) {
         request.preferences = std::move(preset.preferences);
         options.complaints = std::move(preset.complaints);
     } catch (const PresetError& error) {
-        throw Failure(Category::kRequest, error.what());
+        throw FailureOf(error);
     }
 }
 

@@ -23,7 +23,7 @@ struct Options {
     Task task = Task::kConvert;
     Request request; ///< With the preset's preferences.
     std::string preset = kStandardPreset;
-    std::vector<std::string> complaints; ///< Of the preset.
+    std::vector<Sentence> complaints; ///< Of the preset.
 
     std::optional<std::string> plan; ///< Where a plan is to be written.
     Division division;

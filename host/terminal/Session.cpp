@@ -85,7 +85,7 @@ void Session::Started(const Start& news) {
         preview_.emplace(*options_.preview, options_.request.overwrite);
     Arm();
     reporter_->Started(news); // whoever reads this may send signals
-    for (const std::string& complaint : options_.complaints)
+    for (const Sentence& complaint : options_.complaints)
         reporter_->Warn(complaint, {});
 }
 

@@ -33,10 +33,10 @@ Written WrittenBy(const Options& options) {
 void CheckSideFile(const char* option, const std::string& path, const Options& options) {
     const Written written = WrittenBy(options);
     const bool isRead = IsOneOfMany(path, options);
-    const char* other = isRead ? "the source itself" : WhatIsReadFrom(path, written.request);
-    if (other == nullptr)
+    std::string other = isRead ? "the source itself" : WhatIsReadFrom(path, written.request).Text();
+    if (other.empty())
         other = RoleAmongOutputs(path, written);
-    if (other != nullptr) {
+    if (!other.empty()) {
         throw Failure(Category::kRequest,
                       fmt::format("{} \"{}\" is {}; give it another name", option, path, other));
     }

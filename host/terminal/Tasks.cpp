@@ -9,6 +9,7 @@
 #include "host/pieces/Planner.h"
 #include "host/presets/Preset.h"
 #include "host/terminal/Describe.h"
+#include "host/terminal/ExitCode.h"
 #include "host/terminal/JsonLine.h"
 #include "host/terminal/Listings.h"
 #include "text/Printable.h"
@@ -91,13 +92,14 @@ Plan MakeOrFindPlan(const Request& request, const Division& division, const std:
 ExitCode WriteNewPlan(const Options& options, const StandardStreams& streams) {
     const std::string& path = *options.plan;
     if (options.request.input == kStandardInput)
-        throw Failure(Category::kRequest, "whoever makes the pieces cannot read this standard input");
+        throw Failure(Category::kRequest,
+                      Sentence("whoever makes the pieces cannot read this standard input"));
     CheckOutput(options.request); // before all is made that cannot be joined
     const Plan plan = MakeOrFindPlan(options.request, options.division, path);
     if (options.quiet)
         return ExitCode::kDone;
-    for (const std::string& complaint : options.complaints)
-        streams.PrintError(fmt::format("movieconv: warning: {}", complaint));
+    for (const Sentence& complaint : options.complaints)
+        streams.PrintError(fmt::format("movieconv: warning: {}", complaint.Text()));
     if (const std::string cost = TellBitRate(plan); !cost.empty())
         streams.PrintError(fmt::format("movieconv: warning: {}", cost));
     PrintWhole(streams,
@@ -113,11 +115,11 @@ ExitCode WriteNewPlan(const Options& options, const StandardStreams& streams) {
 std::string ShowPreset(const std::string& name, const StandardStreams& streams) {
     try {
         const Preset preset = LoadPreset(name);
-        for (const std::string& complaint : preset.complaints)
-            streams.PrintError(fmt::format("movieconv: warning: {}", complaint));
+        for (const Sentence& complaint : preset.complaints)
+            streams.PrintError(fmt::format("movieconv: warning: {}", complaint.Text()));
         return EscapeCommands(preset.text);
     } catch (const PresetError& error) {
-        throw Failure(Category::kRequest, error.what());
+        throw FailureOf(error);
     }
 }
 

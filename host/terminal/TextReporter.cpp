@@ -107,7 +107,7 @@ void SparseReporter::LeftBehind(const NotCarried& report) {
         details = " (" + details + ")";
     LeaveLine();
     Streams().PrintError(fmt::format("movieconv: not carried: {}{}{}{}: {}", Whose(report.input, {}),
-                                     report.kind, number, details, report.reason));
+                                     report.kind, number, details, report.reason.Text()));
 }
 
 void SparseReporter::End(const EndReport& report) {

@@ -144,9 +144,9 @@ TEST(FileLedger, HoldsWhatWasClosedAgainstWhatIsThere) {
     EXPECT_EQ(ledger.FindMissing(), std::nullopt);
     WriteFile(folder / "other", "movie");
     fs::rename(folder / "other", folder / "a");
-    EXPECT_NE(ledger.FindMissing()->find("another file"), std::string::npos);
+    EXPECT_NE(ledger.FindMissing()->Text().find("another file"), std::string::npos);
     fs::remove(folder / "a");
-    EXPECT_NE(ledger.FindMissing()->find("vanished"), std::string::npos);
+    EXPECT_NE(ledger.FindMissing()->Text().find("vanished"), std::string::npos);
     EXPECT_FALSE(ledger.FirstFailure());
 }
 
@@ -215,26 +215,28 @@ TEST(Judgement, SuccessIsProved) {
     Request request = To(folder / "o");
     Request small = request;
     small.maxSize = 4;
-    const Failure vanished(Category::kOutput, "vanished");
+    const Failure vanished(Category::kOutput, Sentence("vanished"));
+    const Sentence bad("bad");
+    const Sentence cut("it is cut off");
     const struct {
         const char* what;
         Evidence evidence;
         std::optional<Category> expected;
     } cases[] = {
-        {"all is there", {request, full, {}, "", ""}, {}},
-        {"stopped by the user", {request, full, {}, "", "", true, kOutcomeStopped}, {}},
-        {"stopped before anything was written", {request, empty, {}, "", "", true, kOutcomeStopped}, {}},
-        {"stopped by nobody", {request, full, {}, "", "", false, kOutcomeStopped}, Category::kInternal},
-        {"broken off", {request, full, vanished, "", "", false, kOutcomeStopped}, Category::kOutput},
-        {"no memory", {request, full, {}, "", "", false, kOutcomeFailed}, Category::kInternal},
-        {"nothing written", {request, empty, {}, "", ""}, Category::kSource},
-        {"unreadable", {request, empty, {}, "bad", "", true}, Category::kSource},
-        {"read in part", {request, full, {}, "bad", ""}, Category::kSource},
-        {"cut off", {request, full, {}, "", "it is cut off"}, Category::kSource},
-        {"cut off behind the stop", {request, full, {}, "", "it is cut off", true, kOutcomeStopped}, {}},
-        {"full disk", {request, failed, {}, "bad", ""}, Category::kNoSpace},
-        {"not there any more", {request, gone, {}, "", ""}, Category::kOutput},
-        {"too large", {small, full, {}, "", ""}, Category::kOutput},
+        {"all is there", {request, full, {}, {}, {}}, {}},
+        {"stopped by the user", {request, full, {}, {}, {}, true, kOutcomeStopped}, {}},
+        {"stopped before anything was written", {request, empty, {}, {}, {}, true, kOutcomeStopped}, {}},
+        {"stopped by nobody", {request, full, {}, {}, {}, false, kOutcomeStopped}, Category::kInternal},
+        {"broken off", {request, full, vanished, {}, {}, false, kOutcomeStopped}, Category::kOutput},
+        {"no memory", {request, full, {}, {}, {}, false, kOutcomeFailed}, Category::kInternal},
+        {"nothing written", {request, empty, {}, {}, {}}, Category::kSource},
+        {"unreadable", {request, empty, {}, bad, {}, true}, Category::kSource},
+        {"read in part", {request, full, {}, bad, {}}, Category::kSource},
+        {"cut off", {request, full, {}, {}, cut}, Category::kSource},
+        {"cut off behind the stop", {request, full, {}, {}, cut, true, kOutcomeStopped}, {}},
+        {"full disk", {request, failed, {}, bad, {}}, Category::kNoSpace},
+        {"not there any more", {request, gone, {}, {}, {}}, Category::kOutput},
+        {"too large", {small, full, {}, {}, {}}, Category::kOutput},
     };
     for (const auto& test : cases) {
         const std::optional<Failure> failure = FindFailure(test.evidence);

@@ -26,7 +26,7 @@ using Lines = std::vector<std::string>;
 
 std::string LineOf(const NotCarried& what) {
     return what.kind + " " + (what.number ? std::to_string(*what.number) : "") + " (" + what.codec + ", " +
-           what.language + "): " + what.reason;
+           what.language + "): " + what.reason.Text();
 }
 
 /// A second with two sounds, subtitles, chapters, texts and a font, all of them with labels.

@@ -247,10 +247,10 @@ TEST(Job, TellsClipsOfAnotherDivisionThatStay) {
             continue;
         EXPECT_EQ(listener.warnings[0].kind, Warning::Kind::kOlderClips); // which nobody can go on with
         const std::string last = '"' + (folder / "movie_03.mkv") + "\" of an earlier conversion stay";
-        EXPECT_EQ(listener.warnings[0].text.find(
+        EXPECT_EQ(listener.warnings[0].text.Text().find(
                       left == 1 ? last : '"' + (folder / "movie_02.mkv") + "\" to " + last),
                   0u)
-            << listener.warnings[0].text;
+            << listener.warnings[0].text.Text();
     }
 }
 
@@ -292,7 +292,7 @@ TEST(Job, WaitsForAsMuchRoomAsItNeeds) {
     ASSERT_FALSE(listener.warnings.empty());
     const Warning& warning = listener.warnings.back();
     EXPECT_EQ(warning.kind, Warning::Kind::kWaitsForRoom);
-    EXPECT_NE(warning.text.find("room for"), std::string::npos) << warning.text;
+    EXPECT_NE(warning.text.Text().find("room for"), std::string::npos) << warning.text.Text();
     EXPECT_EQ(std::count(listener.phases.begin(), listener.phases.end(), Phase::kWaitingForRoom), 1);
     EXPECT_EQ(LookAt(folder / "disk/out.mkv").pictures.size(), 75u);
 }

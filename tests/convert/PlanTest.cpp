@@ -279,7 +279,7 @@ TEST(SizePlan, ChoosesRatesThatFit) {
             EXPECT_EQ(fitted.videoMaxRate, fitted.videoRate);
             // Where there is little for each pixel, there are fewer of them.
             EXPECT_EQ(fitted.size.has_value(), output != "o.mp3" && size < 400'000'000) << output << size;
-            EXPECT_NE(TellSize(fitted), "");
+            EXPECT_NE(TellSize(fitted).Text(), "");
         }
     }
     Request little = To("o.mp4");

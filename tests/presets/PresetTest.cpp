@@ -50,7 +50,7 @@ TEST_F(Presets, OfTheProgramAreWhole) {
     EXPECT_EQ(list.back().name, "classic");
     for (const PresetSummary& summary : list) {
         const Preset preset = LoadPreset(summary.name);
-        EXPECT_TRUE(preset.complaints.empty()) << preset.complaints.front();
+        EXPECT_TRUE(preset.complaints.empty()) << preset.complaints.front().Text();
         EXPECT_FALSE(summary.description.empty()) << summary.name;
         EXPECT_EQ(preset.description, summary.description);
     }
@@ -119,10 +119,10 @@ TEST_F(Presets, KeepUnknownKeysAndTellThem) {
     EXPECT_NE(preset.text.find("sharpness"), std::string::npos) << preset.text;
     EXPECT_NE(preset.text.find("2026"), std::string::npos) << preset.text;
     ASSERT_EQ(preset.complaints.size(), 2u);
-    EXPECT_EQ(preset.complaints[0].find(Path("new.json") + ":3: there is no \"video/sharpness\""), 0u)
-        << preset.complaints[0];
-    EXPECT_EQ(preset.complaints[1].find(Path("new.json") + ":5: there is no \"year\""), 0u)
-        << preset.complaints[1];
+    EXPECT_EQ(preset.complaints[0].Text().find(Path("new.json") + ":3: there is no \"video/sharpness\""), 0u)
+        << preset.complaints[0].Text();
+    EXPECT_EQ(preset.complaints[1].Text().find(Path("new.json") + ":5: there is no \"year\""), 0u)
+        << preset.complaints[1].Text();
 }
 
 TEST_F(Presets, TellWhereAndWhyTheyCannotBeUsed) {

@@ -100,7 +100,7 @@ TEST_P(DecodersFrom, GiveEveryPictureOnceWithItsTimeAndAllSound) {
     const std::vector<double> beeps = Beginnings(seen, 44100);
     ASSERT_FALSE(beeps.empty());
     EXPECT_NEAR(beeps.back(), 3, 0.012);
-    EXPECT_TRUE(movie.Complaints().empty()) << movie.Complaints()[0];
+    EXPECT_TRUE(movie.Complaints().empty()) << movie.Complaints()[0].Text();
 
     // At the end they give nothing and stay there.
     EXPECT_LT(movie.Pictures()->DecodeNext(1), 1);
@@ -286,7 +286,8 @@ TEST(Decoders, JoinRecordingsThatStartANewClock) {
         EXPECT_NEAR(static_cast<double>(seen.sound.size()) / 44100, 8, 0.2) << first;
         EXPECT_EQ(Beginnings(seen, 44100).size(), 8u) << first;
         ASSERT_FALSE(movie.Complaints().empty()) << first;
-        EXPECT_NE(movie.Complaints()[0].find("jumped once"), std::string::npos) << movie.Complaints()[0];
+        EXPECT_NE(movie.Complaints()[0].Text().find("jumped once"), std::string::npos)
+            << movie.Complaints()[0].Text();
         Movie again(folder / "joined.ts", {});
         EXPECT_NEAR(static_cast<double>(TakeAll(again, 6).pictures.size()), 50, 5) << first;
     }
@@ -303,7 +304,7 @@ TEST(Decoders, TellWhatABroadcastAnnouncesLateAndTheyLeaveOut) {
     EXPECT_EQ(seen.pictures.size(), 100u);
     EXPECT_EQ(Beginnings(seen, 44100).size(), 8u);
     ASSERT_FALSE(movie.Complaints().empty());
-    EXPECT_EQ(movie.Complaints()[0],
+    EXPECT_EQ(movie.Complaints()[0].Text(),
               "pictures of 4 s, which the source announces only at 4 s, were left out");
     ASSERT_TRUE(movie.Missing());
     EXPECT_NEAR(movie.Missing()->reached, 4, 0.2);
@@ -327,7 +328,8 @@ TEST(Decoders, TellWhatDoesNotFitIntoWhatBeganSmaller) {
         EXPECT_NEAR(seen.pictures[square].luma, 235 * 0.75 + 16 * 0.25, 3);
     }
     EXPECT_NEAR(seen.pictures[10].luma, 235, 2);
-    const std::vector<std::string> told = movie.Complaints();
+    const auto complaints = movie.Complaints();
+    const std::vector<std::string> told(complaints.begin(), complaints.end());
     for (const char* text : {"some of its pictures have 320x240 and were fitted into those of 160x120",
                              "some of its sound has 6 channels and got 2"})
         EXPECT_EQ(std::count(told.begin(), told.end(), text), 1) << text;

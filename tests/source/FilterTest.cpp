@@ -115,7 +115,7 @@ TEST(Filters, BringHdrOfOtherMatricesOrNameThem) {
                          {"-i", path, "-c", "copy", "-bsf:v", "hevc_metadata=matrix_coefficients=" + matrix}),
                     {});
         const VideoImage* image = movie.Pictures()->GetCurrentImage();
-        return image != nullptr ? std::to_string(image->pY[0]) : movie.ReadError();
+        return image != nullptr ? std::to_string(image->pY[0]) : movie.ReadError().Text();
     };
     EXPECT_EQ(convert("10"), convert("9")); // the same but for the constant luminance
     const std::string error = convert("11");

@@ -118,7 +118,7 @@ TEST(Playlist, OfFragmentsIsReadFromAnyTimeOn) { // which its demultiplexer cann
     const inspect::Seen seen = inspect::TakeAll(movie, 2);
     ASSERT_NEAR(static_cast<double>(seen.pictures.size()), 50, 1); // its clock begins with the sound
     EXPECT_NEAR(seen.pictures.back().luma, LumaOf(99), 2);
-    EXPECT_EQ(movie.ReadError(), "");
+    EXPECT_EQ(movie.ReadError().Text(), "");
 }
 
 } // namespace

@@ -197,12 +197,12 @@ TEST(Failures, KeepTheFirstReasonAndStopTheOthers) {
     int stops = 0;
     Failures failures([&] { ++stops; });
     EXPECT_TRUE(failures.Attempt([] {}));
-    failures.Note("");
-    EXPECT_EQ(failures.First(), "");
+    failures.Note({});
+    EXPECT_EQ(failures.First().Text(), "");
     EXPECT_FALSE(failures.Attempt([] { throw std::runtime_error("first"); }));
     EXPECT_FALSE(failures.Attempt([] { throw std::bad_alloc(); }));
-    failures.Note("third");
-    EXPECT_EQ(failures.First(), "first");
+    failures.Note(std::string("third"));
+    EXPECT_EQ(failures.First().Text(), "first");
     EXPECT_EQ(stops, 2);
 }
 

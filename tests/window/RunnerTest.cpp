@@ -204,7 +204,7 @@ TEST_F(RunnerTest, SavesWishesAsAPresetAndTakesThemBack) {
     EXPECT_EQ(OnShelf("mine").extension, "mkv");
     EXPECT_NEAR(OnShelf("mine").quality, 80, 3);
     const movieconv::Preset mine = movieconv::LoadPreset("mine");
-    EXPECT_TRUE(mine.complaints.empty()) << mine.complaints.front();
+    EXPECT_TRUE(mine.complaints.empty()) << mine.complaints.front().Text();
     EXPECT_EQ(mine.preferences.fitWithin->height, 720);
     EXPECT_EQ(mine.preferences.frameRate, 24);
     EXPECT_TRUE(mine.preferences.copySound && OnShelf("mine").copiesSound);

@@ -46,7 +46,7 @@ QString FailureSentence(const Failure& failure, const std::string& source) {
     std::error_code unknown;
     const QString what = failure.Why() == Reason::kNoMemory && failure.Text().empty()
                              ? Texts::tr("There was not enough memory.")
-                             : SentenceOf(failure.Text());
+                             : SentenceOf(failure.Words());
     QString advice;
     if (failure.Why() == Reason::kExists)
         advice = Texts::tr("Choose another name, or let it be replaced.");
@@ -134,13 +134,13 @@ public:
         try {
             parts_->job.Start();
         } catch (const std::system_error& error) {
-            Fail(Category::kInternal, error.what());
+            Fail(Category::kInternal, WordsOf(error));
         }
     }
     /// Instead of beginning.
-    void Fail(Category category, const std::string& text) {
+    void Fail(Category category, const Sentence& words) {
         Verdict verdict;
-        verdict.failure.emplace(category, text);
+        verdict.failure.emplace(category, words);
         parts_->interpreter.Ended(verdict);
     }
     void Pause() override { parts_->job.Pause(); }
@@ -195,7 +195,7 @@ PresetFacts ConvertRunner::LoadPreset(const std::string& path) {
     try {
         return TakeIntoShelf(path);
     } catch (const PresetError& error) {
-        throw std::runtime_error(SentenceOf(error.what()).toStdString());
+        throw std::runtime_error(SentenceOf(error.Words()).toStdString());
     }
 }
 
@@ -215,7 +215,7 @@ std::unique_ptr<Run> ConvertRunner::Start(const Order& order, std::shared_ptr<Ru
         return run;
     } catch (const PresetError& error) {
         auto run = std::make_unique<ConvertRun>(Request(), std::move(listener), remover_);
-        run->Fail(Category::kRequest, error.what());
+        run->Fail(Category::kRequest, error.Words());
         return run;
     }
 }

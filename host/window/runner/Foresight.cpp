@@ -80,7 +80,7 @@ void WarnOfContent(Findings& findings, const Order& order, const Request& reques
             findings.notes += ForesightTexts::tr("Not carried over:") + QStringLiteral("\n• ") +
                               left.join(QStringLiteral("\n• "));
     } catch (const Failure& failure) {
-        findings.warnings += SentenceOf(failure.Text());
+        findings.warnings += SentenceOf(failure.Words());
     }
 }
 
@@ -128,7 +128,7 @@ Findings Foresee(const Order& order) {
         WarnOfContent(findings, order, request);
         WarnOfRoom(findings, order, request, folder);
     } catch (const PresetError& error) {
-        findings.warnings += SentenceOf(error.what());
+        findings.warnings += SentenceOf(error.Words());
     }
     return findings;
 }

@@ -3,139 +3,116 @@
 #include "host/window/model/CodecNames.h"
 #include "host/window/model/Entry.h"
 #include "host/window/model/Languages.h"
-#include "host/window/runner/LibrarySentences.h"
 
 #include <QCoreApplication>
 #include <QLocale>
-#include <QRegularExpression>
 #include <QStringList>
 
-#include <utility>
+#include <algorithm>
+#include <iterator>
+#include <string>
 #include <vector>
 
 namespace movieconv::window {
 namespace {
 
-constexpr int kMostParts = 6; // of a sentence
+/// Texts that come without a pattern: what a stream is, texts about movies, and errors of FFmpeg's.
+constexpr const char* kTexts[] = {QT_TRANSLATE_NOOP("Library", "pictures"),
+                                  QT_TRANSLATE_NOOP("Library", "sound"),
+                                  QT_TRANSLATE_NOOP("Library", "subtitles"),
+                                  QT_TRANSLATE_NOOP("Library", "chapters"),
+                                  QT_TRANSLATE_NOOP("Library", "cover"),
+                                  QT_TRANSLATE_NOOP("Library", "attachment"),
+                                  QT_TRANSLATE_NOOP("Library", "data"),
+                                  QT_TRANSLATE_NOOP("Library", "tags"),
+                                  QT_TRANSLATE_NOOP("Library", "label"),
+                                  QT_TRANSLATE_NOOP("Library", "language"),
+                                  QT_TRANSLATE_NOOP("Library", "title"),
+                                  QT_TRANSLATE_NOOP("Library", "timecode"),
+                                  QT_TRANSLATE_NOOP("Library", "Invalid data found when processing input"),
+                                  QT_TRANSLATE_NOOP("Library", "Generic error in an external library"),
+                                  QT_TRANSLATE_NOOP("Library", "Unknown error occurred")};
 
 QString Tr(const char* text) {
     return QCoreApplication::translate("Library", text);
 }
 
-using Sentence = std::pair<QRegularExpression, const char*>;
-
-/// What fits a sentence of the library's, with its parts as captures. A part ends with the first that can be
-/// its end: what follows may hold further ones that look like it.
-QRegularExpression PatternOf(const char* sentence) {
-    QString plain = QString::fromUtf8(sentence);
-    for (const char* mark : {"“", "”"})
-        plain.replace(QString::fromUtf8(mark), QStringLiteral("\""));
-    QString pattern = QRegularExpression::escape(plain);
-    for (int number = 1; number <= kMostParts; ++number)
-        pattern.replace(QStringLiteral("\\%%1").arg(number), QStringLiteral("(.+?)"));
-    return QRegularExpression(QRegularExpression::anchoredPattern(pattern),
-                              QRegularExpression::DotMatchesEverythingOption);
+QString Known(const std::string& text) {
+    const bool isKnown = std::find(std::begin(kTexts), std::end(kTexts), text) != std::end(kTexts);
+    return isKnown ? Tr(text.c_str()) : Shown(text);
 }
 
-const std::vector<Sentence>& Sentences() {
-    static const std::vector<Sentence> sentences = [] {
-        std::vector<Sentence> all;
-        for (const char* sentence : LibrarySentences())
-            all.emplace_back(PatternOf(sentence), sentence);
-        return all;
-    }();
-    return sentences;
-}
-
-/// A word of the library's, or what has a name of its own.
-QString Word(const QString& word) {
-    for (const char* known : LibraryNouns()) {
-        if (word == QLatin1String(known))
-            return Tr(known);
-        const QString begin = QString::fromLatin1(known).section(QLatin1String("%1"), 0, 0);
-        if (begin.endsWith(QLatin1Char(' ')) && word.startsWith(begin))
-            return Tr(known).arg(word.mid(begin.size()));
+/// Patterns have straight quotes, in pairs; a translation has its language's.
+QString WithEnglishQuotes(QString words) {
+    bool opens = true;
+    for (QChar& sign : words) {
+        if (sign != QLatin1Char('"'))
+            continue;
+        sign = opens ? QChar(0x201C) : QChar(0x201D);
+        opens = !opens;
     }
-    return word;
+    return words;
 }
 
-/// "a", "a and b", "a, b and c".
-QString List(const QString& list) {
-    QStringList items = list.split(QLatin1String(" and "));
-    QString last = Word(items.takeLast());
-    if (items.isEmpty())
-        return last;
-    items = items.join(QLatin1String(" and ")).split(QLatin1String(", "));
-    for (QString& item : items)
-        item = Word(item);
-    return QCoreApplication::translate("Library", "%1 and %2", "the last two of a list")
-        .arg(items.join(QLatin1String(", ")), last);
-}
-
-/// An amount such as "1.2 GB" with the point of the user's language.
-QString Amount(QString text) {
-    static const QRegularExpression amount(QStringLiteral("^\\d+\\.\\d [kMGT]B$"));
-    if (amount.match(text).hasMatch())
-        text.replace(QLatin1Char('.'), QLocale().decimalPoint());
-    return text;
-}
-
-QString Translated(const QString& text);
-
-/// What is in quotes is a name, of a file or of a codec.
-QString PartOf(const QString& sentence, int number, const QString& part) {
-    if (sentence.contains(QStringLiteral("“%%1”").arg(number)))
-        return CodecName(part);
-    const QString clause = Translated(part);
-    return clause == part ? Amount(List(part)) : clause;
-}
-
-/// `words` with its parts in their places. What a part holds is no place for another.
-QString Filled(const QString& words, const QStringList& parts) {
+/// With the parts in their places: "{}" or "{:.1f}" is the next part, "{0}" the first one.
+QString Filled(const QString& words, const std::vector<Sentence>& parts) {
     QString filled;
+    std::size_t next = 0;
     for (qsizetype at = 0; at < words.size(); ++at) {
-        const int number =
-            words[at] == QLatin1Char('%') && at + 1 < words.size() ? words[at + 1].digitValue() : 0;
-        if (number < 1 || number > parts.size()) {
+        const qsizetype end = words[at] == QLatin1Char('{') ? words.indexOf(QLatin1Char('}'), at) : -1;
+        if (end < 0) {
             filled += words[at];
             continue;
         }
-        filled += parts[number - 1];
-        ++at;
+        const int number = words[at + 1].digitValue();
+        const std::size_t part = number >= 0 ? static_cast<std::size_t>(number) : next++;
+        if (part < parts.size())
+            filled += InWindowsLanguage(parts[part]);
+        at = end;
     }
     return filled;
 }
 
-QString Translated(const QString& text) {
-    for (const auto& [pattern, sentence] : Sentences()) {
-        const QRegularExpressionMatch match = pattern.match(text);
-        if (!match.hasMatch())
-            continue;
-        QStringList parts;
-        for (int number = 1; number <= match.lastCapturedIndex(); ++number)
-            parts += PartOf(QString::fromUtf8(sentence), number, match.captured(number));
-        return Filled(Tr(sentence), parts);
-    }
-    return text;
+/// "a", "a and b", "a, b and c".
+QString Listed(const std::vector<Sentence>& items) {
+    QStringList words;
+    for (const Sentence& item : items)
+        words += InWindowsLanguage(item);
+    if (words.size() < 2)
+        return words.join(QString());
+    const QString last = words.takeLast();
+    return QCoreApplication::translate("Library", "%1 and %2", "the last two of a list")
+        .arg(words.join(QLatin1String(", ")), last);
 }
 
 } // namespace
 
-QString InWindowsLanguage(const std::string& text) {
-    QString own = Shown(text);
-    own.remove(QLatin1String("; see \"movieconv --list-presets\"")); // which is for the terminal
-    return Translated(own);
+QString InWindowsLanguage(const Sentence& sentence) {
+    switch (sentence.Is()) {
+    case Sentence::Kind::kName:
+        return Shown(sentence.Text());
+    case Sentence::Kind::kCodec:
+        return CodecName(Shown(sentence.Text()));
+    case Sentence::Kind::kAmount:
+        return Shown(sentence.Text()).replace(QLatin1Char('.'), QLocale().decimalPoint());
+    case Sentence::Kind::kList:
+        return Listed(sentence.Parts());
+    case Sentence::Kind::kWords:
+        break;
+    }
+    return sentence.Pattern() != nullptr ? Filled(WithEnglishQuotes(Tr(sentence.Pattern())), sentence.Parts())
+                                         : Known(sentence.Text());
 }
 
-QString SentenceOf(const std::string& text) {
-    QString sentence = InWindowsLanguage(text);
-    if (!sentence.isEmpty())
-        sentence[0] = sentence[0].toUpper();
-    return sentence.endsWith(QLatin1Char('.')) || sentence.isEmpty() ? sentence : sentence + QLatin1Char('.');
+QString SentenceOf(const Sentence& sentence) {
+    QString words = InWindowsLanguage(sentence);
+    if (!words.isEmpty())
+        words[0] = words[0].toUpper();
+    return words.endsWith(QLatin1Char('.')) || words.isEmpty() ? words : words + QLatin1Char('.');
 }
 
 QString LineOf(const NotCarried& what) {
-    QString line = Word(QString::fromStdString(what.kind));
+    QString line = Known(what.kind);
     if (what.number)
         line += QStringLiteral(" %1").arg(*what.number);
     QStringList details;

@@ -3,16 +3,17 @@
 #define MOVIECONV_HOST_WINDOW_RUNNER_LIBRARYWORDS_H
 
 #include "host/convert/Observer.h"
+#include "host/sentence/Sentence.h"
 
 #include <QString>
 
 namespace movieconv::window {
 
-/// A clause or a sentence of the library's; what is not known here stays as it is.
-QString InWindowsLanguage(const std::string& text);
+/// By its pattern and its parts, and those in their turn; what the translations do not know stays English.
+QString InWindowsLanguage(const Sentence& sentence);
 
 /// Likewise, with a capital letter and a full stop.
-QString SentenceOf(const std::string& text);
+QString SentenceOf(const Sentence& sentence);
 
 /// "subtitles 3 (Blu-ray (PGS), German): MP4 cannot hold them".
 QString LineOf(const NotCarried& what);

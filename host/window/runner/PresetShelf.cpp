@@ -104,7 +104,7 @@ PresetFacts FactsOf(const Preset& preset) {
         facts.extension = QString::fromUtf8(format->szExtensions).section(QLatin1Char(','), 0, 0);
     facts.quality = UsualQuality(preset);
     facts.copiesSound = preset.preferences.copySound;
-    for (const std::string& complaint : preset.complaints)
+    for (const Sentence& complaint : preset.complaints)
         facts.complaints += SentenceOf(complaint);
     return facts;
 }

@@ -297,24 +297,24 @@
 <context>
     <name>Library</name>
     <message>
-        <source>%1 cannot hold them</source>
-        <translation>%1 kann sie nicht aufnehmen</translation>
+        <source>{} cannot hold them</source>
+        <translation>{} kann sie nicht aufnehmen</translation>
     </message>
     <message>
-        <source>%1 cannot hold them, MKV can</source>
-        <translation>%1 kann sie nicht aufnehmen, MKV kann es</translation>
+        <source>{} cannot hold them, MKV can</source>
+        <translation>{} kann sie nicht aufnehmen, MKV kann es</translation>
     </message>
     <message>
-        <source>%1 cannot hold it</source>
-        <translation>%1 kann das nicht aufnehmen</translation>
+        <source>{} cannot hold it</source>
+        <translation>{} kann das nicht aufnehmen</translation>
     </message>
     <message>
-        <source>%1 holds one track of sound, MKV and MP4 hold several</source>
-        <translation>%1 hat eine Tonspur, MKV und MP4 haben mehrere</translation>
+        <source>{} holds one track of sound, MKV and MP4 hold several</source>
+        <translation>{} hat eine Tonspur, MKV und MP4 haben mehrere</translation>
     </message>
     <message>
-        <source>%1 of them have no length</source>
-        <translation>%1 davon haben keine Länge</translation>
+        <source>{} of them have no length</source>
+        <translation>{} davon haben keine Länge</translation>
     </message>
     <message>
         <source>it cannot be decoded</source>
@@ -373,120 +373,116 @@
         <translation>Daten</translation>
     </message>
     <message>
-        <source>%1 cannot hold it as it is</source>
-        <translation>%1 kann ihn nicht unverändert aufnehmen</translation>
+        <source>{} cannot hold it as it is</source>
+        <translation>{} kann ihn nicht unverändert aufnehmen</translation>
     </message>
     <message>
-        <source>%1 cannot hold its %2</source>
-        <translation>%1 kann davon nicht aufnehmen: %2</translation>
+        <source>{} cannot hold its {}</source>
+        <translation>{} kann davon nicht aufnehmen: {}</translation>
     </message>
     <message>
-        <source>%1 cannot hold one of %2 bytes</source>
-        <translation>%1 kann keines von %2 Byte aufnehmen</translation>
+        <source>{} cannot hold one of {} bytes</source>
+        <translation>{} kann keines von {} Byte aufnehmen</translation>
     </message>
     <message>
-        <source>%1 cannot hold “%2” sound as it is; no format can</source>
-        <translation>%1 kann Ton in „%2“ nicht unverändert aufnehmen, und kein anderes Format kann es</translation>
+        <source>{} cannot hold &quot;{}&quot; sound as it is; no format can</source>
+        <translation>{} kann Ton in „{}“ nicht unverändert aufnehmen, und kein anderes Format kann es</translation>
     </message>
     <message>
-        <source>%1 cannot hold “%2” sound as it is; %3 can</source>
-        <translation>%1 kann Ton in „%2“ nicht unverändert aufnehmen; diese können es: %3</translation>
+        <source>{} cannot hold &quot;{}&quot; sound as it is; {} can</source>
+        <translation>{} kann Ton in „{}“ nicht unverändert aufnehmen; diese können es: {}</translation>
     </message>
     <message>
-        <source>%1 cannot hold short frames of “%2” sound as it is; MKV can</source>
-        <translation>%1 kann kurze Blöcke von Ton „%2“ nicht unverändert enthalten; MKV kann es</translation>
+        <source>{} cannot hold short frames of &quot;{}&quot; sound as it is; MKV can</source>
+        <translation>{} kann kurze Blöcke von Ton „{}“ nicht unverändert enthalten; MKV kann es</translation>
     </message>
     <message>
-        <source>%1 cannot begin the sound as it is %2 s behind the pictures; MKV can</source>
-        <translation>%1 kann unveränderten Ton nicht %2 s nach den Bildern beginnen lassen; MKV kann es</translation>
+        <source>{} cannot begin the sound as it is {:.1f} s behind the pictures; MKV can</source>
+        <translation>{} kann unveränderten Ton nicht {} s nach den Bildern beginnen lassen; MKV kann es</translation>
     </message>
     <message>
-        <source>%1 cannot carry pictures as “%2”</source>
-        <translation>%1 kann keine Bilder in „%2“ aufnehmen</translation>
+        <source>{} cannot carry pictures as &quot;{}&quot;</source>
+        <translation>{} kann keine Bilder in „{}“ aufnehmen</translation>
     </message>
     <message>
-        <source>%1 cannot carry sound as “%2”</source>
-        <translation>%1 kann keinen Ton in „%2“ aufnehmen</translation>
+        <source>{} cannot carry sound as &quot;{}&quot;</source>
+        <translation>{} kann keinen Ton in „{}“ aufnehmen</translation>
     </message>
     <message>
-        <source>%1 carries nothing that “%2” holds; choose another format</source>
-        <translation>%1 kann nichts von dem aufnehmen, was in „%2“ ist; bitte ein anderes Format wählen</translation>
+        <source>{} carries nothing that &quot;{}&quot; holds; choose another format</source>
+        <translation>{} kann nichts von dem aufnehmen, was in „{}“ ist; bitte ein anderes Format wählen</translation>
     </message>
     <message>
-        <source>the extension of “%1” tells no file format</source>
-        <translation>die Endung von „%1“ nennt kein Dateiformat</translation>
+        <source>the extension of &quot;{}&quot; tells no file format</source>
+        <translation>die Endung von „{}“ nennt kein Dateiformat</translation>
     </message>
     <message>
-        <source>the begin, %1 s, is not before the end of “%2”, which is %3 s long</source>
-        <translation>der Anfang, %1 s, liegt nicht vor dem Ende von „%2“, das %3 s lang ist</translation>
+        <source>the begin, {:.3f} s, is not before the end of &quot;{}&quot;, which is {:.3f} s long</source>
+        <translation>der Anfang, {} s, liegt nicht vor dem Ende von „{}“, das {} s lang ist</translation>
     </message>
     <message>
-        <source>“%1” has pictures of %2 bits; HEVC, VP90 and AV01 have some of 10</source>
-        <translation>„%1“ hat Bilder mit %2 Bit; HEVC, VP90 und AV01 haben welche mit 10</translation>
+        <source>&quot;{}&quot; has pictures of {} bits; HEVC, VP90 and AV01 have some of 10</source>
+        <translation>„{}“ hat Bilder mit {} Bit; HEVC, VP90 und AV01 haben welche mit 10</translation>
     </message>
     <message>
-        <source>HDR needs pictures of 10 bits; “%1” has 8 here</source>
-        <translation>HDR braucht Bilder mit 10 Bit; „%1“ hat hier 8</translation>
+        <source>HDR needs pictures of 10 bits; &quot;{}&quot; has 8 here</source>
+        <translation>HDR braucht Bilder mit 10 Bit; „{}“ hat hier 8</translation>
     </message>
     <message>
-        <source>there is no sound “%1”; there is: %2</source>
-        <translation>es gibt keinen Ton „%1“; es gibt: %2</translation>
+        <source>there is no sound &quot;{}&quot;; there is: {}</source>
+        <translation>es gibt keinen Ton „{}“; es gibt: {}</translation>
     </message>
     <message>
-        <source>there are no subtitles “%1”; there are: %2</source>
-        <translation>es gibt keine Untertitel „%1“; es gibt: %2</translation>
+        <source>there are no subtitles &quot;{}&quot;; there are: {}</source>
+        <translation>es gibt keine Untertitel „{}“; es gibt: {}</translation>
     </message>
     <message>
-        <source>the subtitles “%1” cannot be decoded</source>
-        <translation>die Untertitel „%1“ können nicht decodiert werden</translation>
+        <source>the subtitles &quot;{}&quot; cannot be decoded</source>
+        <translation>die Untertitel „{}“ können nicht decodiert werden</translation>
     </message>
     <message>
-        <source>“%1” does not tell how long it is</source>
-        <translation>„%1“ sagt nicht, wie lang es ist</translation>
+        <source>&quot;{}&quot; does not tell how long it is</source>
+        <translation>„{}“ sagt nicht, wie lang es ist</translation>
     </message>
     <message>
-        <source>“%1” is the source itself; give the output another name</source>
-        <translation>„%1“ ist die Quelle selbst; die neue Datei braucht einen anderen Namen</translation>
+        <source>&quot;{}&quot; is a folder; name a file in it</source>
+        <translation>„{}“ ist ein Ordner; bitte eine Datei darin nennen</translation>
     </message>
     <message>
-        <source>“%1” is a folder; name a file in it</source>
-        <translation>„%1“ ist ein Ordner; bitte eine Datei darin nennen</translation>
+        <source>&quot;{}&quot; is not a file but a device or a pipe; name a file</source>
+        <translation>„{}“ ist keine Datei, sondern ein Gerät oder eine Pipe; bitte eine Datei nennen</translation>
     </message>
     <message>
-        <source>“%1” is not a file but a device or a pipe; name a file</source>
-        <translation>„%1“ ist keine Datei, sondern ein Gerät oder eine Pipe; bitte eine Datei nennen</translation>
+        <source>&quot;{}&quot; is not a folder</source>
+        <translation>„{}“ ist kein Ordner</translation>
     </message>
     <message>
-        <source>“%1” is not a folder</source>
-        <translation>„%1“ ist kein Ordner</translation>
+        <source>&quot;{}&quot; exists</source>
+        <translation>„{}“ gibt es schon</translation>
     </message>
     <message>
-        <source>“%1” exists</source>
-        <translation>„%1“ gibt es schon</translation>
+        <source>the output&apos;s folder &quot;{}&quot; cannot be used: {}</source>
+        <translation>der Zielordner „{}“ ist nicht zu gebrauchen: {}</translation>
     </message>
     <message>
-        <source>the output&apos;s folder “%1” cannot be used: %2</source>
-        <translation>der Zielordner „%1“ ist nicht zu gebrauchen: %2</translation>
+        <source>cannot create files in &quot;{}&quot;: {}; choose another folder</source>
+        <translation>in „{}“ lassen sich keine Dateien anlegen: {}; bitte einen anderen Ordner wählen</translation>
     </message>
     <message>
-        <source>cannot create files in “%1”: %2; choose another folder</source>
-        <translation>in „%1“ lassen sich keine Dateien anlegen: %2; bitte einen anderen Ordner wählen</translation>
+        <source>&quot;{}&quot; holds nothing to convert</source>
+        <translation>in „{}“ ist nichts, was sich umwandeln lässt</translation>
     </message>
     <message>
-        <source>“%1” holds nothing to convert</source>
-        <translation>in „%1“ ist nichts, was sich umwandeln lässt</translation>
+        <source>cannot open &quot;{}&quot;: {}</source>
+        <translation>„{}“ lässt sich nicht öffnen: {}</translation>
     </message>
     <message>
-        <source>cannot open “%1”: %2</source>
-        <translation>„%1“ lässt sich nicht öffnen: %2</translation>
+        <source>cannot read &quot;{}&quot;: {}</source>
+        <translation>„{}“ lässt sich nicht lesen: {}</translation>
     </message>
     <message>
-        <source>cannot read “%1”: %2</source>
-        <translation>„%1“ lässt sich nicht lesen: %2</translation>
-    </message>
-    <message>
-        <source>cannot read the streams of “%1”: %2</source>
-        <translation>die Spuren von „%1“ lassen sich nicht lesen: %2</translation>
+        <source>cannot read the streams of &quot;{}&quot;: {}</source>
+        <translation>die Spuren von „{}“ lassen sich nicht lesen: {}</translation>
     </message>
     <message>
         <source>it is a text, not a movie</source>
@@ -505,48 +501,48 @@
         <translation>es ist eine Abspielliste, die andere Dateien nennt</translation>
     </message>
     <message>
-        <source>“%1” has changed meanwhile</source>
-        <translation>„%1“ hat sich inzwischen geändert</translation>
+        <source>&quot;{}&quot; has changed meanwhile</source>
+        <translation>„{}“ hat sich inzwischen geändert</translation>
     </message>
     <message>
-        <source>reading “%1” failed after %2: %3; what was read is converted</source>
-        <translation>„%1“ war nur bis %2 zu lesen: %3; was gelesen wurde, ist umgewandelt</translation>
+        <source>reading &quot;{}&quot; failed after {}: {}; what was read is converted</source>
+        <translation>„{}“ war nur bis {} zu lesen: {}; was gelesen wurde, ist umgewandelt</translation>
     </message>
     <message>
-        <source>reading “%1” failed after %2: %3</source>
-        <translation>„%1“ war nur bis %2 zu lesen: %3</translation>
+        <source>reading &quot;{}&quot; failed after {}: {}</source>
+        <translation>„{}“ war nur bis {} zu lesen: {}</translation>
     </message>
     <message>
-        <source>the conversion broke off after %1</source>
-        <translation>die Umwandlung brach nach %1 ab</translation>
+        <source>the conversion broke off after {}</source>
+        <translation>die Umwandlung brach nach {} ab</translation>
     </message>
     <message>
-        <source>cannot write “%1”: %2; what was written so far is in “%3”</source>
-        <translation>„%1“ lässt sich nicht schreiben: %2; was bisher geschrieben wurde, ist in „%3“</translation>
+        <source>cannot write &quot;{}&quot;: {}; what was written so far is in &quot;{}&quot;</source>
+        <translation>„{}“ lässt sich nicht schreiben: {}; was bisher geschrieben wurde, ist in „{}“</translation>
     </message>
     <message>
-        <source>cannot write “%1”: %2</source>
-        <translation>„%1“ lässt sich nicht schreiben: %2</translation>
+        <source>cannot write &quot;{}&quot;: {}</source>
+        <translation>„{}“ lässt sich nicht schreiben: {}</translation>
     </message>
     <message>
-        <source>“%1” vanished while it was written: %2</source>
-        <translation>„%1“ verschwand, während es geschrieben wurde: %2</translation>
+        <source>&quot;{}&quot; vanished while it was written: {}</source>
+        <translation>„{}“ verschwand, während es geschrieben wurde: {}</translation>
     </message>
     <message>
-        <source>“%1” was written but stands there no more: it vanished meanwhile</source>
-        <translation>„%1“ wurde geschrieben, ist aber inzwischen verschwunden</translation>
+        <source>&quot;{}&quot; was written but stands there no more: it vanished meanwhile</source>
+        <translation>„{}“ wurde geschrieben, ist aber inzwischen verschwunden</translation>
     </message>
     <message>
-        <source>“%1” was written, but another file stands there now</source>
-        <translation>„%1“ wurde geschrieben, aber jetzt liegt dort eine andere Datei</translation>
+        <source>&quot;{}&quot; was written, but another file stands there now</source>
+        <translation>„{}“ wurde geschrieben, aber jetzt liegt dort eine andere Datei</translation>
     </message>
     <message>
-        <source>“%1” needs about %2, but only %3 are free</source>
-        <translation>„%1“ braucht etwa %2, aber nur %3 sind frei</translation>
+        <source>&quot;{}&quot; needs about {}, but only {} are free</source>
+        <translation>„{}“ braucht etwa {}, aber nur {} sind frei</translation>
     </message>
     <message>
-        <source>no space is left for “%1”; waiting until there is room for %2</source>
-        <translation>für „%1“ ist kein Platz mehr; es wird gewartet, bis Platz für %2 ist</translation>
+        <source>no space is left for &quot;{}&quot;; waiting until there is room for {}</source>
+        <translation>für „{}“ ist kein Platz mehr; es wird gewartet, bis Platz für {} ist</translation>
     </message>
     <message>
         <source>no black borders were found</source>
@@ -557,8 +553,8 @@
         <translation>in einer Pipe kann nicht nach schwarzen Rändern gesucht werden</translation>
     </message>
     <message>
-        <source>%1 cannot hold %2</source>
-        <translation>%1 kann nicht aufnehmen: %2</translation>
+        <source>{} cannot hold {}</source>
+        <translation>{} kann nicht aufnehmen: {}</translation>
     </message>
     <message>
         <source>tags</source>
@@ -590,44 +586,44 @@
         <translation>er gehört zu den Bildern</translation>
     </message>
     <message>
-        <source>“%1” makes no sense</source>
-        <translation>„%1“ ergibt keinen Sinn</translation>
+        <source>&quot;{}&quot; makes no sense</source>
+        <translation>„{}“ ergibt keinen Sinn</translation>
     </message>
     <message>
         <source>one of their texts could not be converted</source>
         <translation>einer ihrer Texte konnte nicht umgewandelt werden</translation>
     </message>
     <message>
-        <source>%1 of their texts could not be converted</source>
-        <translation>%1 ihrer Texte konnten nicht umgewandelt werden</translation>
+        <source>{} of their texts could not be converted</source>
+        <translation>{} ihrer Texte konnten nicht umgewandelt werden</translation>
     </message>
     <message>
-        <source>%1 of them are in other editions or within others</source>
-        <translation>%1 davon gehören zu anderen Fassungen oder stehen innerhalb anderer</translation>
+        <source>{} of them are in other editions or within others</source>
+        <translation>{} davon gehören zu anderen Fassungen oder stehen innerhalb anderer</translation>
     </message>
     <message>
-        <source>%1 of them have titles in further languages</source>
-        <translation>%1 davon haben Titel in weiteren Sprachen</translation>
+        <source>{} of them have titles in further languages</source>
+        <translation>{} davon haben Titel in weiteren Sprachen</translation>
     </message>
     <message>
-        <source>%1 of them are out of their order in time</source>
-        <translation>%1 davon stehen nicht in ihrer zeitlichen Reihenfolge</translation>
+        <source>{} of them are out of their order in time</source>
+        <translation>{} davon stehen nicht in ihrer zeitlichen Reihenfolge</translation>
     </message>
     <message>
-        <source>%1 of them lie outside the movie</source>
-        <translation>%1 davon liegen außerhalb des Films</translation>
+        <source>{} of them lie outside the movie</source>
+        <translation>{} davon liegen außerhalb des Films</translation>
     </message>
     <message>
-        <source>of their texts only the titles are carried, not %1</source>
-        <translation>von ihren Texten gehen nur die Titel mit, nicht aber: %1</translation>
+        <source>of their texts only the titles are carried, not {}</source>
+        <translation>von ihren Texten gehen nur die Titel mit, nicht aber: {}</translation>
     </message>
     <message>
         <source>timecode</source>
         <translation>Zeitcode</translation>
     </message>
     <message>
-        <source>language as %1</source>
-        <translation>die Sprache als %1</translation>
+        <source>language as {}</source>
+        <translation>die Sprache als {}</translation>
     </message>
     <message>
         <source>its sound has no form that could be copied; convert it instead</source>
@@ -638,20 +634,20 @@
         <translation>der Ton ändert dort seine Form und lässt sich nicht weiter kopieren; er muss umgewandelt werden</translation>
     </message>
     <message>
-        <source>there is no file format “%1”</source>
-        <translation>es gibt kein Dateiformat „%1“</translation>
+        <source>there is no file format &quot;{}&quot;</source>
+        <translation>es gibt kein Dateiformat „{}“</translation>
     </message>
     <message>
-        <source>“%1” has no constant quality; give it a bit rate</source>
-        <translation>„%1“ kennt keine gleichbleibende Qualität und braucht eine Bitrate</translation>
+        <source>&quot;{}&quot; has no constant quality; give it a bit rate</source>
+        <translation>„{}“ kennt keine gleichbleibende Qualität und braucht eine Bitrate</translation>
     </message>
     <message>
-        <source>the quality of “%1” goes from %2 (best) to %3, not to %4</source>
-        <translation>die Qualität von „%1“ reicht von %2 (am besten) bis %3, nicht bis %4</translation>
+        <source>the quality of &quot;{}&quot; goes from {} (best) to {}, not to {}</source>
+        <translation>die Qualität von „{}“ reicht von {} (am besten) bis {}, nicht bis {}</translation>
     </message>
     <message>
-        <source>too little is left of the pictures of “%1”, which are %2x%3</source>
-        <translation>von den Bildern von „%1“ mit %2x%3 Punkten bleibt zu wenig übrig</translation>
+        <source>too little is left of the pictures of &quot;{}&quot;, which are {}x{}</source>
+        <translation>von den Bildern von „{}“ mit {}x{} Punkten bleibt zu wenig übrig</translation>
     </message>
     <message>
         <source>there are no pictures in the output to draw subtitles into</source>
@@ -666,96 +662,96 @@
         <translation>nur Filme mit Bildern lassen sich teilen; Ton allein wird eine einzige Datei</translation>
     </message>
     <message>
-        <source>“%1” is a link to a missing file; name that file, or remove the link</source>
-        <translation>„%1“ ist ein Verweis auf eine fehlende Datei; bitte diese Datei nennen oder den Verweis löschen</translation>
+        <source>&quot;{}&quot; is a link to a missing file; name that file, or remove the link</source>
+        <translation>„{}“ ist ein Verweis auf eine fehlende Datei; bitte diese Datei nennen oder den Verweis löschen</translation>
     </message>
     <message>
-        <source>the name of a split output needs an extension, as in “%1”</source>
-        <translation>der Name geteilter Dateien braucht eine Endung, etwa „%1“</translation>
+        <source>the name of a split output needs an extension, as in &quot;{}&quot;</source>
+        <translation>der Name geteilter Dateien braucht eine Endung, etwa „{}“</translation>
     </message>
     <message>
-        <source>the name “%1” is too long to number clips; choose a shorter one</source>
-        <translation>der Name „%1“ ist zu lang, um Teile zu nummerieren; bitte einen kürzeren wählen</translation>
+        <source>the name &quot;{}&quot; is too long to number clips; choose a shorter one</source>
+        <translation>der Name „{}“ ist zu lang, um Teile zu nummerieren; bitte einen kürzeren wählen</translation>
     </message>
     <message>
-        <source>the name “%1” is too long for its file system; choose a shorter one</source>
-        <translation>der Name „%1“ ist zu lang für sein Dateisystem; bitte einen kürzeren wählen</translation>
+        <source>the name &quot;{}&quot; is too long for its file system; choose a shorter one</source>
+        <translation>der Name „{}“ ist zu lang für sein Dateisystem; bitte einen kürzeren wählen</translation>
     </message>
     <message>
-        <source>“%1” holds no pictures and no sound that can be decoded</source>
-        <translation>„%1“ enthält weder Bilder noch Ton, die sich dekodieren lassen</translation>
+        <source>&quot;{}&quot; holds no pictures and no sound that can be decoded</source>
+        <translation>„{}“ enthält weder Bilder noch Ton, die sich dekodieren lassen</translation>
     </message>
     <message>
-        <source>“%1” holds no pictures that can be decoded</source>
-        <translation>„%1“ enthält keine Bilder, die sich dekodieren lassen</translation>
+        <source>&quot;{}&quot; holds no pictures that can be decoded</source>
+        <translation>„{}“ enthält keine Bilder, die sich dekodieren lassen</translation>
     </message>
     <message>
-        <source>“%1” holds no sound that can be decoded</source>
-        <translation>„%1“ enthält keinen Ton, der sich dekodieren lässt</translation>
+        <source>&quot;{}&quot; holds no sound that can be decoded</source>
+        <translation>„{}“ enthält keinen Ton, der sich dekodieren lässt</translation>
     </message>
     <message>
-        <source>cannot read “%1” from its start again</source>
-        <translation>„%1“ lässt sich nicht noch einmal von vorn lesen</translation>
+        <source>cannot read &quot;{}&quot; from its start again</source>
+        <translation>„{}“ lässt sich nicht noch einmal von vorn lesen</translation>
     </message>
     <message>
-        <source>cannot start the decoder %1: %2</source>
-        <translation>der Decoder %1 lässt sich nicht starten: %2</translation>
+        <source>cannot start the decoder {}: {}</source>
+        <translation>der Decoder {} lässt sich nicht starten: {}</translation>
     </message>
     <message>
         <source>it is not a movie, or its index is missing because it was never finished</source>
         <translation>es ist kein Film, oder sein Index fehlt, weil er nie fertig geschrieben wurde</translation>
     </message>
     <message>
-        <source>it names “%1” over and over</source>
-        <translation>es nennt „%1“ immer wieder</translation>
+        <source>it names &quot;{}&quot; over and over</source>
+        <translation>es nennt „{}“ immer wieder</translation>
     </message>
     <message>
-        <source>it names “%1”: %2</source>
-        <translation>es nennt „%1“: %2</translation>
+        <source>it names &quot;{}&quot;: {}</source>
+        <translation>es nennt „{}“: {}</translation>
     </message>
     <message>
-        <source>it names “%1”, another file</source>
-        <translation>es nennt eine andere Datei, „%1“</translation>
+        <source>it names &quot;{}&quot;, another file</source>
+        <translation>es nennt eine andere Datei, „{}“</translation>
     </message>
     <message>
-        <source>it names “%1”, which is not a file&apos;s name</source>
-        <translation>es nennt „%1“, was kein Dateiname ist</translation>
+        <source>it names &quot;{}&quot;, which is not a file&apos;s name</source>
+        <translation>es nennt „{}“, was kein Dateiname ist</translation>
     </message>
     <message>
-        <source>it names “%1”, which does not exist</source>
-        <translation>es nennt „%1“, was es nicht gibt</translation>
+        <source>it names &quot;{}&quot;, which does not exist</source>
+        <translation>es nennt „{}“, was es nicht gibt</translation>
     </message>
     <message>
-        <source>it names “%1”, which lies outside its folder</source>
-        <translation>es nennt „%1“, was außerhalb seines Ordners liegt</translation>
+        <source>it names &quot;{}&quot;, which lies outside its folder</source>
+        <translation>es nennt „{}“, was außerhalb seines Ordners liegt</translation>
     </message>
     <message>
-        <source>it names “%1”, which is no regular file</source>
-        <translation>es nennt „%1“, was keine gewöhnliche Datei ist</translation>
+        <source>it names &quot;{}&quot;, which is no regular file</source>
+        <translation>es nennt „{}“, was keine gewöhnliche Datei ist</translation>
     </message>
     <message>
-        <source>its borders cannot be looked for: %1</source>
-        <translation>die Ränder lassen sich nicht suchen: %1</translation>
+        <source>its borders cannot be looked for: {}</source>
+        <translation>die Ränder lassen sich nicht suchen: {}</translation>
     </message>
     <message>
-        <source>its pictures cannot be filtered: %1</source>
-        <translation>die Bilder lassen sich nicht filtern: %1</translation>
+        <source>its pictures cannot be filtered: {}</source>
+        <translation>die Bilder lassen sich nicht filtern: {}</translation>
     </message>
     <message>
-        <source>its HDR pictures with the colour matrix “%1” cannot be brought to BT.709: %2</source>
-        <translation>die HDR-Bilder mit der Farbmatrix „%1“ lassen sich nicht auf BT.709 bringen: %2</translation>
+        <source>its HDR pictures with the colour matrix &quot;{}&quot; cannot be brought to BT.709: {}</source>
+        <translation>die HDR-Bilder mit der Farbmatrix „{}“ lassen sich nicht auf BT.709 bringen: {}</translation>
     </message>
     <message>
         <source>the file was cut meanwhile</source>
         <translation>die Datei wurde inzwischen gekürzt</translation>
     </message>
     <message>
-        <source>it is cut off: it ends at %1 although it announces %2</source>
-        <translation>sie ist abgeschnitten: sie endet bei %1, obwohl sie %2 ankündigt</translation>
+        <source>it is cut off: it ends at {} although it announces {}</source>
+        <translation>sie ist abgeschnitten: sie endet bei {}, obwohl sie {} ankündigt</translation>
     </message>
     <message>
-        <source>it ends at %1 although it announces %2</source>
-        <translation>sie endet bei %1, obwohl sie %2 ankündigt</translation>
+        <source>it ends at {} although it announces {}</source>
+        <translation>sie endet bei {}, obwohl sie {} ankündigt</translation>
     </message>
     <message>
         <source>it is cut off</source>
@@ -766,36 +762,36 @@
         <translation>sie lässt sich nicht noch einmal von vorn lesen</translation>
     </message>
     <message>
-        <source>the subtitles cannot be decoded: %1</source>
-        <translation>die Untertitel lassen sich nicht dekodieren: %1</translation>
+        <source>the subtitles cannot be decoded: {}</source>
+        <translation>die Untertitel lassen sich nicht dekodieren: {}</translation>
     </message>
     <message>
-        <source>the subtitles cannot be drawn: %1</source>
-        <translation>die Untertitel lassen sich nicht zeichnen: %1</translation>
+        <source>the subtitles cannot be drawn: {}</source>
+        <translation>die Untertitel lassen sich nicht zeichnen: {}</translation>
     </message>
     <message>
         <source>the subtitles of a pipe cannot be drawn into its pictures</source>
         <translation>Untertitel aus einer Pipe lassen sich nicht in ihre Bilder zeichnen</translation>
     </message>
     <message>
-        <source>the subtitles %1 are not there any more</source>
-        <translation>die Untertitel %1 gibt es nicht mehr</translation>
+        <source>the subtitles {} are not there any more</source>
+        <translation>die Untertitel {} gibt es nicht mehr</translation>
     </message>
     <message>
         <source>the subtitles cannot be read ahead of the pictures</source>
         <translation>die Untertitel lassen sich nicht vor den Bildern lesen</translation>
     </message>
     <message>
-        <source>cannot make a folder for the subtitles: %1</source>
-        <translation>für die Untertitel lässt sich kein Ordner anlegen: %1</translation>
+        <source>cannot make a folder for the subtitles: {}</source>
+        <translation>für die Untertitel lässt sich kein Ordner anlegen: {}</translation>
     </message>
     <message>
-        <source>cannot write the subtitles to “%1”</source>
-        <translation>die Untertitel lassen sich nicht nach „%1“ schreiben</translation>
+        <source>cannot write the subtitles to &quot;{}&quot;</source>
+        <translation>die Untertitel lassen sich nicht nach „{}“ schreiben</translation>
     </message>
     <message>
-        <source>cannot read subtitles from “%1”: %2</source>
-        <translation>aus „%1“ lassen sich keine Untertitel lesen: %2</translation>
+        <source>cannot read subtitles from &quot;{}&quot;: {}</source>
+        <translation>aus „{}“ lassen sich keine Untertitel lesen: {}</translation>
     </message>
     <message>
         <source>it holds none of text</source>
@@ -806,84 +802,84 @@
         <translation>es ist zu groß für Untertitel</translation>
     </message>
     <message>
-        <source>it is not in the character set “%1”</source>
-        <translation>es ist nicht im Zeichensatz „%1“</translation>
+        <source>it is not in the character set &quot;{}&quot;</source>
+        <translation>es ist nicht im Zeichensatz „{}“</translation>
     </message>
     <message>
-        <source>there is no character set “%1”</source>
-        <translation>es gibt keinen Zeichensatz „%1“</translation>
+        <source>there is no character set &quot;{}&quot;</source>
+        <translation>es gibt keinen Zeichensatz „{}“</translation>
     </message>
     <message>
-        <source>%1; %2 were written, %3 are free: make room or choose another disk</source>
-        <translation>%1; %2 wurden geschrieben, %3 sind frei: bitte Platz schaffen oder einen anderen Datenträger wählen</translation>
+        <source>{}; {} were written, {} are free: make room or choose another disk</source>
+        <translation>{}; {} wurden geschrieben, {} sind frei: bitte Platz schaffen oder einen anderen Datenträger wählen</translation>
     </message>
     <message>
-        <source>Writing to “%1” failed after %2 bytes: %3</source>
-        <translation>das Schreiben nach „%1“ misslang nach %2 Byte: %3</translation>
+        <source>Writing to &quot;{}&quot; failed after {} bytes: {}</source>
+        <translation>das Schreiben nach „{}“ misslang nach {} Byte: {}</translation>
     </message>
     <message>
-        <source>Syncing “%1” failed: %2</source>
-        <translation>das Sichern von „%1“ auf dem Datenträger misslang: %2</translation>
+        <source>Syncing &quot;{}&quot; failed: {}</source>
+        <translation>das Sichern von „{}“ auf dem Datenträger misslang: {}</translation>
     </message>
     <message>
-        <source>Renaming “%1” failed: %2</source>
-        <translation>das Umbenennen von „%1“ misslang: %2</translation>
+        <source>Renaming &quot;{}&quot; failed: {}</source>
+        <translation>das Umbenennen von „{}“ misslang: {}</translation>
     </message>
     <message>
-        <source>No file can be created in the folder “%1”: %2</source>
-        <translation>im Ordner „%1“ lässt sich keine Datei anlegen: %2</translation>
+        <source>No file can be created in the folder &quot;{}&quot;: {}</source>
+        <translation>im Ordner „{}“ lässt sich keine Datei anlegen: {}</translation>
     </message>
     <message>
-        <source>Another conversion is writing this file (%1)</source>
-        <translation>eine andere Umwandlung schreibt diese Datei (%1)</translation>
+        <source>Another conversion is writing this file ({})</source>
+        <translation>eine andere Umwandlung schreibt diese Datei ({})</translation>
     </message>
     <message>
-        <source>The file exists already (%1)</source>
-        <translation>die Datei gibt es schon (%1)</translation>
+        <source>The file exists already ({})</source>
+        <translation>die Datei gibt es schon ({})</translation>
     </message>
     <message>
-        <source>The encoder for “%1” does not accept %2: %3</source>
-        <translation>der Encoder für „%1“ nimmt %2 nicht an: %3</translation>
+        <source>The encoder for &quot;{}&quot; does not accept {}: {}</source>
+        <translation>der Encoder für „{}“ nimmt {} nicht an: {}</translation>
     </message>
     <message>
-        <source>The encoder %1 failed: %2</source>
-        <translation>der Encoder %1 versagte: %2</translation>
+        <source>The encoder {} failed: {}</source>
+        <translation>der Encoder {} versagte: {}</translation>
     </message>
     <message>
-        <source>Pictures of %1x%2 cannot be written; choose another size</source>
-        <translation>Bilder mit %1x%2 Punkten lassen sich nicht schreiben; bitte eine andere Größe wählen</translation>
+        <source>Pictures of {}x{} cannot be written; choose another size</source>
+        <translation>Bilder mit {}x{} Punkten lassen sich nicht schreiben; bitte eine andere Größe wählen</translation>
     </message>
     <message>
         <source>There is not enough memory</source>
         <translation>der Arbeitsspeicher reicht nicht</translation>
     </message>
     <message>
-        <source>No thread can be started: %1</source>
-        <translation>es lässt sich kein Thread starten: %1</translation>
+        <source>No thread can be started: {}</source>
+        <translation>es lässt sich kein Thread starten: {}</translation>
     </message>
     <message>
         <source>the media writer gave no reason</source>
         <translation>ein Grund wurde nicht genannt</translation>
     </message>
     <message>
-        <source>“%1” holds %2 s of pictures, but %3 s were sent into it</source>
-        <translation>„%1“ enthält %2 s an Bildern, aber %3 s wurden hineingegeben</translation>
+        <source>&quot;{}&quot; holds {:.3f} s of pictures, but {:.3f} s were sent into it</source>
+        <translation>„{}“ enthält {} s an Bildern, aber {} s wurden hineingegeben</translation>
     </message>
     <message>
-        <source>“%1” holds %2 s of sound, but %3 s were sent into it</source>
-        <translation>„%1“ enthält %2 s an Ton, aber %3 s wurden hineingegeben</translation>
+        <source>&quot;{}&quot; holds {:.3f} s of sound, but {:.3f} s were sent into it</source>
+        <translation>„{}“ enthält {} s an Ton, aber {} s wurden hineingegeben</translation>
     </message>
     <message>
-        <source>“%1” has %2 bytes, but %3 were written into it</source>
-        <translation>„%1“ hat %2 Byte, aber %3 wurden hineingeschrieben</translation>
+        <source>&quot;{}&quot; has {} bytes, but {} were written into it</source>
+        <translation>„{}“ hat {} Byte, aber {} wurden hineingeschrieben</translation>
     </message>
     <message>
-        <source>“%1” has become larger than asked for: %2</source>
-        <translation>„%1“ ist größer geworden als gewünscht: %2</translation>
+        <source>&quot;{}&quot; has become larger than asked for: {}</source>
+        <translation>„{}“ ist größer geworden als gewünscht: {}</translation>
     </message>
     <message>
-        <source>the conversion broke off after %1, for want of memory</source>
-        <translation>die Umwandlung brach nach %1 ab, weil der Arbeitsspeicher nicht reichte</translation>
+        <source>the conversion broke off after {}, for want of memory</source>
+        <translation>die Umwandlung brach nach {} ab, weil der Arbeitsspeicher nicht reichte</translation>
     </message>
     <message>
         <source>the conversion could not be started</source>
@@ -894,8 +890,8 @@
         <translation>für die Umwandlung ließ sich kein Thread starten</translation>
     </message>
     <message>
-        <source>no thread can be started: %1</source>
-        <translation>es lässt sich kein Thread starten: %1</translation>
+        <source>no thread can be started: {}</source>
+        <translation>es lässt sich kein Thread starten: {}</translation>
     </message>
     <message>
         <source>no memory for the converter</source>
@@ -918,20 +914,20 @@
         <translation>unbekannter Fehler</translation>
     </message>
     <message>
-        <source>“%1” needs about %2 to %3 more, but only %4 are free</source>
-        <translation>„%1“ braucht noch etwa %2 bis %3, aber nur %4 sind frei</translation>
+        <source>&quot;{}&quot; needs about {} to {} more, but only {} are free</source>
+        <translation>„{}“ braucht noch etwa {} bis {}, aber nur {} sind frei</translation>
     </message>
     <message>
-        <source>the pictures are cropped to %1x%2: %3 above, %4 below, %5 left, %6 right</source>
-        <translation>die Bilder sind auf %1x%2 Punkte beschnitten: %3 oben, %4 unten, %5 links, %6 rechts</translation>
+        <source>the pictures are cropped to {}x{}: {} above, {} below, {} left, {} right</source>
+        <translation>die Bilder sind auf {}x{} Punkte beschnitten: {} oben, {} unten, {} links, {} rechts</translation>
     </message>
     <message>
         <source>1 of its subtitles was not in UTF-8 and taken for Windows-1252</source>
         <translation>1 Untertitel war nicht in UTF-8 und wurde als Windows-1252 gelesen</translation>
     </message>
     <message>
-        <source>%1 of its subtitles were not in UTF-8 and taken for Windows-1252</source>
-        <translation>%1 Untertitel waren nicht in UTF-8 und wurden als Windows-1252 gelesen</translation>
+        <source>{} of its subtitles were not in UTF-8 and taken for Windows-1252</source>
+        <translation>{} Untertitel waren nicht in UTF-8 und wurden als Windows-1252 gelesen</translation>
     </message>
     <message>
         <source>interlaced pictures were made progressive</source>
@@ -942,36 +938,36 @@
         <translation>die HDR-Bilder wurden auf Licht und Farben von BT.709 gebracht</translation>
     </message>
     <message>
-        <source>its pictures of %1 bits got 8</source>
-        <translation>die Bilder mit %1 Bit bekamen 8</translation>
+        <source>its pictures of {} bits got 8</source>
+        <translation>die Bilder mit {} Bit bekamen 8</translation>
     </message>
     <message>
         <source>interlaced pictures stayed as they are, in files that do not tell it</source>
         <translation>Halbbilder blieben, wie sie sind, in Dateien, die es nicht sagen</translation>
     </message>
     <message>
-        <source>its pictures of %1 bits got 10</source>
-        <translation>die Bilder mit %1 Bit bekamen 10</translation>
+        <source>its pictures of {} bits got 10</source>
+        <translation>die Bilder mit {} Bit bekamen 10</translation>
     </message>
     <message>
-        <source>its %1 pictures a second got %2</source>
-        <translation>aus %1 Bildern je Sekunde wurden %2</translation>
+        <source>its {:.0f} pictures a second got {:.0f}</source>
+        <translation>aus {} Bildern je Sekunde wurden {}</translation>
     </message>
     <message>
-        <source>its %1 sound became %2</source>
-        <translation>der Ton in %1 wurde %2</translation>
+        <source>its {} sound became {}</source>
+        <translation>der Ton in {} wurde {}</translation>
     </message>
     <message>
-        <source>its sound of %1 Hz got %2</source>
-        <translation>der Ton mit %1 Hz bekam %2</translation>
+        <source>its sound of {} Hz got {}</source>
+        <translation>der Ton mit {} Hz bekam {}</translation>
     </message>
     <message>
-        <source>its sound of %1 channels got %2</source>
-        <translation>der Ton mit %1 Kanälen bekam %2</translation>
+        <source>its sound of {} channels got {}</source>
+        <translation>der Ton mit {} Kanälen bekam {}</translation>
     </message>
     <message>
-        <source>its %1 pictures keep their colours at half the resolution (4:2:0)</source>
-        <translation>die Bilder in %1 behalten ihre Farben in halber Auflösung (4:2:0)</translation>
+        <source>its {} pictures keep their colours at half the resolution (4:2:0)</source>
+        <translation>die Bilder in {} behalten ihre Farben in halber Auflösung (4:2:0)</translation>
     </message>
     <message>
         <source>the transparency of its pictures was left out</source>
@@ -1002,84 +998,84 @@
         <translation>die Zeit der Quelle sprang einmal; die Stücke wurden aneinandergefügt</translation>
     </message>
     <message>
-        <source>the source&apos;s clock jumped %1 times; the parts were joined</source>
-        <translation>die Zeit der Quelle sprang %1-mal; die Stücke wurden aneinandergefügt</translation>
+        <source>the source&apos;s clock jumped {} times; the parts were joined</source>
+        <translation>die Zeit der Quelle sprang {}-mal; die Stücke wurden aneinandergefügt</translation>
     </message>
     <message>
-        <source>%1 damaged pieces of picture data were skipped</source>
-        <translation>beschädigte Stücke der Bilddaten wurden übersprungen: %1</translation>
+        <source>{} damaged pieces of picture data were skipped</source>
+        <translation>beschädigte Stücke der Bilddaten wurden übersprungen: {}</translation>
     </message>
     <message>
-        <source>%1 damaged pieces of sound data were skipped</source>
-        <translation>beschädigte Stücke der Tondaten wurden übersprungen: %1</translation>
+        <source>{} damaged pieces of sound data were skipped</source>
+        <translation>beschädigte Stücke der Tondaten wurden übersprungen: {}</translation>
     </message>
     <message>
-        <source>%1 pictures had a missing or falling time stamp</source>
-        <translation>Bilder ohne oder mit rückwärts laufendem Zeitstempel: %1</translation>
+        <source>{} pictures had a missing or falling time stamp</source>
+        <translation>Bilder ohne oder mit rückwärts laufendem Zeitstempel: {}</translation>
     </message>
     <message>
-        <source>the sound had %1 gaps or overlaps, which were closed</source>
-        <translation>Lücken oder Überlappungen im Ton wurden geschlossen: %1</translation>
+        <source>the sound had {} gaps or overlaps, which were closed</source>
+        <translation>Lücken oder Überlappungen im Ton wurden geschlossen: {}</translation>
     </message>
     <message>
-        <source>some of its pictures have %1x%2 and were fitted into those of %3x%4</source>
-        <translation>einige Bilder haben %1x%2 und wurden in solche von %3x%4 eingepasst</translation>
+        <source>some of its pictures have {}x{} and were fitted into those of {}x{}</source>
+        <translation>einige Bilder haben {}x{} und wurden in solche von {}x{} eingepasst</translation>
     </message>
     <message>
-        <source>some of its sound has %1 channels and got %2</source>
-        <translation>ein Teil des Tons hat %1 Kanäle und bekam %2</translation>
+        <source>some of its sound has {} channels and got {}</source>
+        <translation>ein Teil des Tons hat {} Kanäle und bekam {}</translation>
     </message>
     <message>
-        <source>%1 damaged pieces of sound data were skipped in stream %2</source>
-        <translation>beschädigte Stücke der Tondaten in Spur %2 wurden übersprungen: %1</translation>
+        <source>{} damaged pieces of sound data were skipped in stream {}</source>
+        <translation>beschädigte Stücke der Tondaten in Spur {1} wurden übersprungen: {0}</translation>
     </message>
     <message>
-        <source>the sound of stream %1 had %2 gaps or overlaps, which were closed</source>
-        <translation>Lücken oder Überlappungen im Ton von Spur %1 wurden geschlossen: %2</translation>
+        <source>the sound of stream {} had {} gaps or overlaps, which were closed</source>
+        <translation>Lücken oder Überlappungen im Ton von Spur {} wurden geschlossen: {}</translation>
     </message>
     <message>
-        <source>pictures of %1 s, which the source announces only at %2 s, were left out</source>
-        <translation>Bilder von %1 s, die die Quelle erst bei %2 s ankündigt, wurden weggelassen</translation>
+        <source>pictures of {:.0f} s, which the source announces only at {:.0f} s, were left out</source>
+        <translation>Bilder von {} s, die die Quelle erst bei {} s ankündigt, wurden weggelassen</translation>
     </message>
     <message>
-        <source>sound of %1 s, which the source announces only at %2 s, was left out</source>
-        <translation>Ton von %1 s, den die Quelle erst bei %2 s ankündigt, wurde weggelassen</translation>
+        <source>sound of {:.0f} s, which the source announces only at {:.0f} s, was left out</source>
+        <translation>Ton von {} s, den die Quelle erst bei {} s ankündigt, wurde weggelassen</translation>
     </message>
     <message>
-        <source>%1: the parent “%2” has this preset as a parent itself</source>
-        <translation>%1: die Grundlage „%2“ hat diese Vorlage selbst als Grundlage</translation>
+        <source>{}: the parent &quot;{}&quot; has this preset as a parent itself</source>
+        <translation>{}: die Grundlage „{}“ hat diese Vorlage selbst als Grundlage</translation>
     </message>
     <message>
-        <source>%1: there is no preset “%2”</source>
-        <translation>%1: es gibt keine Vorlage „%2“</translation>
+        <source>{}: there is no preset &quot;{}&quot;</source>
+        <translation>{}: es gibt keine Vorlage „{}“</translation>
     </message>
     <message>
-        <source>there is no preset “%1”</source>
-        <translation>es gibt keine Vorlage „%1“</translation>
+        <source>there is no preset &quot;{}&quot;</source>
+        <translation>es gibt keine Vorlage „{}“</translation>
     </message>
     <message>
-        <source>%1: “%2” is there twice</source>
-        <translation>%1: „%2“ steht zweimal da</translation>
+        <source>{}: &quot;{}&quot; is there twice</source>
+        <translation>{}: „{}“ steht zweimal da</translation>
     </message>
     <message>
-        <source>%1: this is no JSON: %2</source>
-        <translation>%1: das ist kein JSON: %2</translation>
+        <source>{}: this is no JSON: {}</source>
+        <translation>{}: das ist kein JSON: {}</translation>
     </message>
     <message>
-        <source>cannot read the preset “%1”: %2</source>
-        <translation>die Vorlage „%1“ lässt sich nicht lesen: %2</translation>
+        <source>cannot read the preset &quot;{}&quot;: {}</source>
+        <translation>die Vorlage „{}“ lässt sich nicht lesen: {}</translation>
     </message>
     <message>
-        <source>“%1” is too large for a preset</source>
-        <translation>„%1“ ist zu groß für eine Vorlage</translation>
+        <source>&quot;{}&quot; is too large for a preset</source>
+        <translation>„{}“ ist zu groß für eine Vorlage</translation>
     </message>
     <message>
         <source>a preset has a name</source>
         <translation>eine Vorlage hat einen Namen</translation>
     </message>
     <message>
-        <source>%1: “%2” has to be %3</source>
-        <translation>%1: „%2“ muss %3 sein</translation>
+        <source>{}: &quot;{}&quot; has to be {}</source>
+        <translation>{}: „{}“ muss {} sein</translation>
     </message>
     <message>
         <source>a text</source>
@@ -1106,24 +1102,24 @@
         <translation>eine Zahl von 0 bis 63, oder solche Zahlen nach Bildhöhe oder Codec</translation>
     </message>
     <message>
-        <source>a bit rate such as “%1”, or such rates by number of channels</source>
-        <translation>eine Bitrate wie „%1“, oder solche Raten nach Zahl der Kanäle</translation>
+        <source>a bit rate such as &quot;{}&quot;, or such rates by number of channels</source>
+        <translation>eine Bitrate wie „{}“, oder solche Raten nach Zahl der Kanäle</translation>
     </message>
     <message>
-        <source>a bit rate such as “%1”</source>
-        <translation>eine Bitrate wie „%1“</translation>
+        <source>a bit rate such as &quot;{}&quot;</source>
+        <translation>eine Bitrate wie „{}“</translation>
     </message>
     <message>
-        <source>“%1” of an earlier conversion stays beside the new clips</source>
-        <translation>„%1“ aus einer früheren Umwandlung bleibt neben den neuen Clips</translation>
+        <source>&quot;{}&quot; of an earlier conversion stays beside the new clips</source>
+        <translation>„{}“ aus einer früheren Umwandlung bleibt neben den neuen Clips</translation>
     </message>
     <message>
-        <source>“%1” to “%2” of an earlier conversion stay beside the new clips</source>
-        <translation>„%1“ bis „%2“ aus einer früheren Umwandlung bleiben neben den neuen Clips</translation>
+        <source>&quot;{}&quot; to &quot;{}&quot; of an earlier conversion stay beside the new clips</source>
+        <translation>„{}“ bis „{}“ aus einer früheren Umwandlung bleiben neben den neuen Clips</translation>
     </message>
     <message>
-        <source>a frame rate from %1 to %2, such as 25 or “%3”</source>
-        <translation>eine Bildrate von %1 bis %2, etwa 25 oder „%3“</translation>
+        <source>a frame rate from {} to {}, such as 25 or &quot;{}&quot;</source>
+        <translation>eine Bildrate von {} bis {}, etwa 25 oder „{}“</translation>
     </message>
     <message>
         <source>slowest, slower, slow, medium, fast, faster or fastest</source>
@@ -1134,28 +1130,24 @@
         <translation>baseline, main oder high</translation>
     </message>
     <message>
-        <source>a size such as “%1”</source>
-        <translation>eine Größe wie „%1“</translation>
+        <source>a size such as &quot;{}&quot;</source>
+        <translation>eine Größe wie „{}“</translation>
     </message>
     <message>
         <source>true or false</source>
         <translation>true oder false</translation>
     </message>
     <message>
-        <source>“%1”: %2</source>
-        <translation>„%1“: %2</translation>
+        <source>&quot;{}&quot;: {}</source>
+        <translation>„{}“: {}</translation>
     </message>
     <message>
         <source>none</source>
         <translation>keine</translation>
     </message>
     <message>
-        <source>input failed</source>
-        <translation>das Lesen misslang</translation>
-    </message>
-    <message>
-        <source>%1:1: a preset is a JSON object, in braces</source>
-        <translation>%1:1: eine Vorlage ist ein JSON-Objekt in geschweiften Klammern</translation>
+        <source>{}:1: a preset is a JSON object, in braces</source>
+        <translation>{}:1: eine Vorlage ist ein JSON-Objekt in geschweiften Klammern</translation>
     </message>
     <message>
         <source>a number from 1 to 8</source>
@@ -1166,16 +1158,80 @@
         <translation>eine Zahl von 4000 bis 384000</translation>
     </message>
     <message>
-        <source>%1: there is no “%2” in presets; it has no effect</source>
-        <translation>%1: „%2“ gibt es in Vorlagen nicht; es bewirkt nichts</translation>
+        <source>{}: there is no &quot;{}&quot; in presets; it has no effect</source>
+        <translation>{}: „{}“ gibt es in Vorlagen nicht; es bewirkt nichts</translation>
     </message>
     <message>
-        <source>“%1” is a file of subtitles that is read; give the output another name</source>
-        <translation>„%1“ ist eine Untertiteldatei, die gelesen wird; die neue Datei braucht einen anderen Namen</translation>
+        <source>{}: this is nested too deep for a preset</source>
+        <translation>{}: das ist für eine Vorlage zu tief verschachtelt</translation>
     </message>
     <message>
-        <source>%1: this is nested too deep for a preset</source>
-        <translation>%1: das ist für eine Vorlage zu tief verschachtelt</translation>
+        <source>the script is too long or not a file</source>
+        <translation>das Skript ist zu lang oder keine Datei</translation>
+    </message>
+    <message>
+        <source>it names &quot;{}&quot;, which is not a plain name</source>
+        <translation>es nennt „{}“, was kein einfacher Name ist</translation>
+    </message>
+    <message>
+        <source>it names &quot;{}&quot;, which is not a movie</source>
+        <translation>es nennt „{}“, was kein Film ist</translation>
+    </message>
+    <message>
+        <source>its line &quot;{}&quot; is not understood</source>
+        <translation>seine Zeile „{}“ ist nicht zu verstehen</translation>
+    </message>
+    <message>
+        <source>its folder has a name that scripts cannot lie in</source>
+        <translation>sein Ordner hat einen Namen, in dem Skripte nicht liegen können</translation>
+    </message>
+    <message>
+        <source>cannot open &quot;{}&quot;: a file that it names: {}</source>
+        <translation>„{}“ lässt sich nicht öffnen: eine Datei, die es nennt: {}</translation>
+    </message>
+    <message>
+        <source>&quot;{}&quot; is {}; give the output another name</source>
+        <translation>„{}“ ist {}; die neue Datei braucht einen anderen Namen</translation>
+    </message>
+    <message>
+        <source>the source itself</source>
+        <translation>die Quelle selbst</translation>
+    </message>
+    <message>
+        <source>a file of subtitles that is read</source>
+        <translation>eine Untertiteldatei, die gelesen wird</translation>
+    </message>
+    <message>
+        <source>a codec without a bit rate cannot keep below a size</source>
+        <translation>ein Codec ohne Bitrate kann keine Größe einhalten</translation>
+    </message>
+    <message>
+        <source>{} are too little for {}</source>
+        <translation>{} sind zu wenig für {}</translation>
+    </message>
+    <message>
+        <source>pictures at {} kbit/s in {}x{}</source>
+        <translation>Bilder mit {} kbit/s in {}x{}</translation>
+    </message>
+    <message>
+        <source>pictures at {} kbit/s</source>
+        <translation>Bilder mit {} kbit/s</translation>
+    </message>
+    <message>
+        <source>sound at {} kbit/s</source>
+        <translation>Ton mit {} kbit/s</translation>
+    </message>
+    <message>
+        <source>to keep below {}: {}, {}</source>
+        <translation>um unter {} zu bleiben: {}, {}</translation>
+    </message>
+    <message>
+        <source>to keep below {}: {}</source>
+        <translation>um unter {} zu bleiben: {}</translation>
+    </message>
+    <message>
+        <source>to keep below {}:</source>
+        <translation>um unter {} zu bleiben:</translation>
     </message>
 </context>
 <context>
