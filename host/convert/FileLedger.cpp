@@ -59,10 +59,10 @@ Sentence MissingFrom(const WriterStatus& file) {
         file.dVideoWritten / static_cast<double>(std::max<int64_t>(1, file.llPicturesWritten));
     if (lacks(file.dVideoWritten, file.dVideoReceived, picture))
         return Say("\"{}\" holds {:.3f} s of pictures, but {:.3f} s were sent into it", path,
-                   double{file.dVideoWritten}, double{file.dVideoReceived});
+                   file.dVideoWritten, file.dVideoReceived);
     if (lacks(file.dAudioWritten, file.dAudioReceived, 0))
-        return Say("\"{}\" holds {:.3f} s of sound, but {:.3f} s were sent into it", path,
-                   double{file.dAudioWritten}, double{file.dAudioReceived});
+        return Say("\"{}\" holds {:.3f} s of sound, but {:.3f} s were sent into it", path, file.dAudioWritten,
+                   file.dAudioReceived);
     return {};
 }
 

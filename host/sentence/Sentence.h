@@ -15,7 +15,7 @@ public:
     enum class Kind {
         kWords,  ///< Made by Say; without a pattern a text that someone else made, such as FFmpeg.
         kName,   ///< A name, a number, a time: the same in all languages.
-        kCodec,  ///< FFmpeg's name of a codec, or a code of the media writer's.
+        kCodec,  ///< FFmpeg's name of a codec.
         kAmount, ///< Bytes, with a decimal point: "1.2 GB".
         kList,   ///< The parts, as "a", "a and b", "a, b and c".
     };
@@ -28,8 +28,7 @@ public:
     /// With the parts in the pattern's places. `pattern` has to last.
     Sentence(const char* pattern, std::vector<Sentence> parts);
 
-    const std::string& Text() const { return text_; }     ///< In English.
-    operator const std::string&() const { return text_; } // NOLINT(*-explicit-*)
+    const std::string& Text() const { return text_; } ///< In English.
     bool IsEmpty() const { return text_.empty(); }
 
     Kind Is() const { return kind_; }

@@ -78,7 +78,7 @@ std::string Explain(const Warning& warning) {
     case Warning::Kind::kLeftover:
         return warning.text.Text() + "; the same command with --resume goes on with them";
     default:
-        return warning.text;
+        return warning.text.Text();
     }
 }
 

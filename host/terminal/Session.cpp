@@ -86,7 +86,7 @@ void Session::Started(const Start& news) {
     Arm();
     reporter_->Started(news); // whoever reads this may send signals
     for (const Sentence& complaint : options_.complaints)
-        reporter_->Warn(complaint, {});
+        reporter_->Warn(complaint.Text(), {});
 }
 
 void Session::Arm() {

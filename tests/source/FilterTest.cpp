@@ -41,9 +41,9 @@ Combed LookFor(const std::string& path, Deinterlace deinterlace) {
         if (movie.Pictures()->DecodeNext(1) < 1)
             break;
     }
-    for (const std::string& complaint : movie.Complaints())
-        if (complaint.find("interlaced") != std::string::npos)
-            seen.told = complaint;
+    for (const auto& complaint : movie.Complaints())
+        if (complaint.Text().find("interlaced") != std::string::npos)
+            seen.told = complaint.Text();
     seen.comb /= seen.pictures;
     return seen;
 }
