@@ -33,12 +33,12 @@ Written WrittenBy(const Options& options) {
 void CheckSideFile(const char* option, const std::string& path, const Options& options) {
     const Written written = WrittenBy(options);
     const bool isRead = IsOneOfMany(path, options);
-    std::string other = isRead ? "the source itself" : WhatIsReadFrom(path, written.request).Text();
-    if (other.empty())
-        other = RoleAmongOutputs(path, written);
-    if (!other.empty()) {
+    std::string role = isRead ? "the source itself" : WhatIsReadFrom(path, written.request).Text();
+    if (const char* other = RoleAmongOutputs(path, written); role.empty() && other != nullptr)
+        role = other;
+    if (!role.empty()) {
         throw Failure(Category::kRequest,
-                      fmt::format("{} \"{}\" is {}; give it another name", option, path, other));
+                      fmt::format("{} \"{}\" is {}; give it another name", option, path, role));
     }
 }
 

@@ -72,7 +72,7 @@ std::vector<std::pair<QString, QString>> GermanSentences() {
 }
 
 WriterStatus Failed(const char* what, int systemError) {
-    WriterStatus status;
+    WriterStatus status{};
     status.nSystemError = systemError;
     qstrncpy(status.szWhat, what, sizeof status.szWhat);
     return status;
