@@ -12,6 +12,7 @@
 #include "media/MediaRecords.h"
 
 #include <new>
+#include <utility>
 
 namespace movieconv {
 namespace {
@@ -94,10 +95,11 @@ std::optional<NotCarried> FurtherTracks::AddFile(const SubtitleFileWish& wish, c
 
 void FurtherTracks::AddPackets(const StreamInfo& stream) {
     WriterTrack track{};
-    track.pParameters = movie_.StreamOf(stream.index).codecpar;
+    av::CodecParameters parameters = movie_.ParametersOf(stream.index);
+    track.pParameters = parameters.get();
     BesidePackets& source =
         OpenedBeside([&]() -> BesidePackets& { return movie_.Beside().ReadPackets(stream.index); });
-    tracks_.push_back({track, &source, stream});
+    tracks_.push_back({track, &source, stream, nullptr, std::move(parameters)});
 }
 
 std::vector<SubtitleTrack> FurtherTracks::Finish() {

@@ -43,6 +43,7 @@ private:
         BesideTrack* source;
         StreamInfo stream;
         CopiedSound* copied = nullptr;
+        av::CodecParameters parameters = nullptr; // of packets, where nobody else keeps them
     };
 
     void AddSound(const StreamInfo& stream);

@@ -2,6 +2,7 @@
 
 #include "host/sentence/Say.h"
 #include "host/source/Charset.h"
+#include "host/source/CueSettings.h"
 #include "host/source/EarlierCues.h"
 #include "host/source/MediaTime.h"
 
@@ -30,15 +31,17 @@ BesideSound& BesideTracks::ReadSound(int stream) {
 }
 
 BesidePackets& BesideTracks::ReadPackets(int stream) {
-    const bool isPlain = IsPlainText(StreamOf(stream).codecpar->codec_id);
-    const auto toUtf8 = [this, isPlain](AVPacket& packet) {
-        if (isPlain && MakeUtf8(packet))
+    const AVCodecID codec = source_.ParametersOf(stream)->codec_id;
+    const auto toUsualForm = [this, codec](AVPacket& packet) {
+        if (IsPlainText(codec) && MakeUtf8(packet))
             ++cuesInOtherCharset_;
+        if (codec == AV_CODEC_ID_WEBVTT)
+            TakeCueSettings(packet);
     };
-    const auto take = [this, stream, toUtf8](int64_t until, bool wait) {
+    const auto take = [this, stream, toUsualForm](int64_t until, bool wait) {
         Demuxer::Beside taken = demuxer_.TakeBeside(stream, until, wait);
         if (taken.packet)
-            toUtf8(*taken.packet);
+            toUsualForm(*taken.packet);
         return taken;
     };
     const auto clock = [this](int64_t stamp, AVRational timeBase) {
@@ -49,7 +52,7 @@ BesidePackets& BesideTracks::ReadPackets(int stream) {
     if (bounds_.begin > 0) {
         std::vector<av::Packet> earlier = EarlierCues(stream);
         for (const av::Packet& packet : earlier)
-            toUtf8(*packet);
+            toUsualForm(*packet);
         track.Precede(std::move(earlier));
     }
     return track;

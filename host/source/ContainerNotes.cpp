@@ -25,7 +25,7 @@ ContainerNotes OfMp4(const InputFile& file) {
         const Part language = boxes.Find(boxes.Find(track, av::BoxType("mdia")), av::BoxType("elng"));
         const Part title = boxes.Find(boxes.Find(track, av::BoxType("udta")), av::BoxType("name"));
         notes.streams.push_back({LanguageTagFrom(boxes.Text(language, kVersionAndFlags, kLongestTag)),
-                                 boxes.Text(title, 0, kLongestTitle)});
+                                 boxes.Text(title, 0, kLongestTitle), AV_CODEC_ID_NONE});
         return true;
     });
     return notes;

@@ -14,8 +14,9 @@ namespace movieconv {
 /// Texts are empty where the container tells none, and in whatever character set it has them.
 struct ContainerNotes {
     struct Stream {
-        std::string languageTag; ///< By BCP 47, "pt-BR".
-        std::string title;       ///< Of the family of MP4.
+        std::string languageTag;            ///< By BCP 47, "pt-BR".
+        std::string title;                  ///< Of the family of MP4.
+        AVCodecID codec = AV_CODEC_ID_NONE; ///< Where FFmpeg has none for Matroska's name of it.
     };
     struct File {
         std::string name;

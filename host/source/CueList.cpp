@@ -53,9 +53,8 @@ void ReadStream(CueList& list, const Source& source, const BurnWish& wish, bool 
     AVFormatContext* context = reader.Context();
     if (stream >= static_cast<int>(context->nb_streams))
         throw TrackError(Say("the subtitles {} are not there any more", stream));
-    const AVStream& found = *context->streams[stream];
-    CheckDecodable(*found.codecpar, wish);
-    list.parameters = av::CopyOf(*found.codecpar);
+    list.parameters = source.ParametersOf(stream);
+    CheckDecodable(*list.parameters, wish);
     reader.Select({stream});
     PacketClock clock(source.Info(), reader);
     reader.SelectBeside(clock.Witnesses());

@@ -24,6 +24,7 @@ constexpr uint64_t kTracks = 0x1654AE6B;
 constexpr uint64_t kTrack = 0xAE;
 constexpr uint64_t kTrackType = 0x83;
 constexpr uint64_t kTrackLanguage = 0x22B59D;
+constexpr uint64_t kTrackCodec = 0x86;
 constexpr uint64_t kChapters = 0x1043A770;
 constexpr uint64_t kEdition = 0x45B9;
 constexpr uint64_t kChapter = 0xB6;
@@ -47,6 +48,11 @@ constexpr uint64_t kTagLanguage = 0x447A;
 constexpr int64_t kLongestLanguage = 36; // with its end
 constexpr int64_t kLongestName = 4096;   // also of titles
 constexpr int64_t kLongestText = 1 << 20;
+
+/// The codecs whose names FFmpeg does not read.
+AVCodecID CodecNamed(const std::string& name) {
+    return name == "S_TEXT/WEBVTT" ? AV_CODEC_ID_WEBVTT : AV_CODEC_ID_NONE;
+}
 
 /// What one file tells.
 class MatroskaReader {
@@ -107,8 +113,9 @@ private:
         ForEach(Locate(kTracks), kTrack, [&](const Part& track) {
             const uint64_t type = elements_.Number(elements_.Find(track, kTrackType));
             if (std::find(kTypes.begin(), kTypes.end(), type) != kTypes.end())
-                notes_.streams.push_back(
-                    {LanguageTagFrom(Text(track, kTrackLanguage, kLongestLanguage)), {}});
+                notes_.streams.push_back({LanguageTagFrom(Text(track, kTrackLanguage, kLongestLanguage)),
+                                          {},
+                                          CodecNamed(Text(track, kTrackCodec, kLongestName))});
         });
     }
 

@@ -50,8 +50,8 @@ public:
     /// The streams that go into the output beside Pictures() and Sound().
     BesideTracks& Beside() { return beside_; }
 
-    /// A stream of Info() as the container describes it. Valid until the conversion.
-    const AVStream& StreamOf(int stream) const { return *source_.Reader().Context()->streams[stream]; }
+    /// Source::ParametersOf. Only before the conversion.
+    av::CodecParameters ParametersOf(int stream) const { return source_.ParametersOf(stream); }
 
     /// Ends both streams at once, so that nobody waits for a slow source. Any thread.
     void Stop();

@@ -103,6 +103,15 @@ std::vector<uint8_t> Source::StoredFile(int stream) const {
     return {};
 }
 
+av::CodecParameters Source::ParametersOf(int stream) const {
+    av::CodecParameters parameters = av::CopyOf(*reader_.Context()->streams[stream]->codecpar);
+    const std::string& codec = info_.streams[static_cast<std::size_t>(stream)].codec;
+    if (parameters->codec_id == AV_CODEC_ID_NONE)
+        if (const AVCodecDescriptor* known = avcodec_descriptor_get_by_name(codec.c_str()))
+            parameters->codec_id = known->id;
+    return parameters;
+}
+
 const AVStream* Source::PictureStream() const {
     return info_.pictures ? reader_.Context()->streams[info_.pictures->index] : nullptr;
 }

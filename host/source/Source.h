@@ -28,6 +28,10 @@ public:
     /// The content of a cover or an attachment; empty for other streams.
     std::vector<uint8_t> StoredFile(int stream) const;
 
+    /// What a decoder or a multiplexer has to know of a stream: what FFmpeg's demultiplexer tells, with the
+    /// codec of Info(), which that one may not know.
+    av::CodecParameters ParametersOf(int stream) const;
+
     /// Null without such a stream. Valid until the reader rewinds.
     const AVStream* PictureStream() const;
     const AVStream* SoundStream() const;

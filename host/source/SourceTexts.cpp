@@ -2,6 +2,7 @@
 
 #include "host/source/Charset.h"
 #include "host/source/Languages.h"
+#include "host/source/StreamDescription.h"
 
 #include <algorithm>
 #include <cctype>
@@ -15,6 +16,8 @@ extern "C" {
 
 namespace movieconv {
 namespace {
+
+constexpr std::string_view kNoCodec = "none"; // what FFmpeg calls it
 
 /// The text of that name, in any case, in `tags`, which may be constant.
 template <class Tags>
@@ -128,6 +131,8 @@ void TakeNotes(const ContainerNotes& notes, SourceInfo& info) {
             stream.languageTag = tag;
         if (stream.title.empty())
             stream.title = Decoded(notes.streams[i].title);
+        if (notes.streams[i].codec != AV_CODEC_ID_NONE && stream.codec == kNoCodec)
+            SetCodec(stream, notes.streams[i].codec);
     }
     for (const Tag& tag : notes.repeated)
         ReplaceTag(info.tags, tag.key, tag.value);

@@ -9,7 +9,7 @@
 
 namespace movieconv {
 
-/// Adds what the container tells and FFmpeg doesn't read: languages, titles, names of files.
+/// Adds what the container tells and FFmpeg doesn't read: languages, titles, names of files, codecs.
 void TakeNotes(const ContainerNotes& notes, SourceInfo& info);
 
 /// `container` is FFmpeg's short name.

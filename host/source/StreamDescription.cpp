@@ -251,7 +251,7 @@ StreamInfo DescribeStream(AVFormatContext& context, AVStream* stream, int64_t st
     StreamInfo info;
     info.index = stream->index;
     info.kind = KindOf(stream);
-    info.codec = avcodec_get_name(parameters.codec_id);
+    SetCodec(info, parameters.codec_id);
     if (const char* profile = avcodec_profile_name(parameters.codec_id, parameters.profile))
         info.profile = profile;
     info.language = TagOf(stream->metadata, "language");
@@ -259,7 +259,6 @@ StreamInfo DescribeStream(AVFormatContext& context, AVStream* stream, int64_t st
         info.language.clear();
     info.title = TagOf(stream->metadata, "title");
     info.flags = FlagsOf(stream);
-    info.decodable = avcodec_find_decoder(parameters.codec_id) != nullptr;
     if (stream->start_time != AV_NOPTS_VALUE)
         info.begin = SecondsFrom(start, stream->start_time, stream->time_base);
     if (stream->duration > 0)
@@ -272,9 +271,7 @@ StreamInfo DescribeStream(AVFormatContext& context, AVStream* stream, int64_t st
     info.bytes = info.kind == StreamKind::kCover        ? stream->attached_pic.size
                  : info.kind == StreamKind::kAttachment ? parameters.extradata_size
                                                         : 0;
-    const AVCodecDescriptor* codec = avcodec_descriptor_get(parameters.codec_id);
     info.holdsChapters = IsChapterTrack(parameters);
-    info.textual = codec != nullptr && (codec->props & AV_CODEC_PROP_TEXT_SUB) != 0;
     if (parameters.codec_type == AVMEDIA_TYPE_VIDEO) {
         info.pictures = DescribePictures(context, stream);
         info.pictures->duration = info.duration;
@@ -303,6 +300,13 @@ std::string_view KindName(StreamKind kind) {
         break;
     }
     return "data";
+}
+
+void SetCodec(StreamInfo& info, AVCodecID codec) {
+    const AVCodecDescriptor* descriptor = avcodec_descriptor_get(codec);
+    info.codec = avcodec_get_name(codec);
+    info.decodable = avcodec_find_decoder(codec) != nullptr;
+    info.textual = descriptor != nullptr && (descriptor->props & AV_CODEC_PROP_TEXT_SUB) != 0;
 }
 
 void TakeLight(const AVMasteringDisplayMetadata* display, const AVContentLightMetadata* light,

@@ -17,6 +17,9 @@ namespace movieconv {
 std::vector<StreamInfo> DescribeStreams(AVFormatContext& context, int64_t start);
 std::vector<Chapter> DescribeChapters(const AVFormatContext& context, int64_t start);
 
+/// Describes a stream as one of that codec.
+void SetCodec(StreamInfo& info, AVCodecID codec);
+
 /// What people wrote: nothing that a multiplexer notes about its own file.
 std::vector<Tag> DescribeTags(const AVDictionary* metadata);
 

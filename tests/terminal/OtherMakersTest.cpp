@@ -17,6 +17,7 @@ using program::Result;
 using test_movies::Args;
 using test_movies::CountedPictures;
 using test_movies::Join;
+using test_movies::Words;
 using whole_movie::Json;
 
 /// One second with subtitles in Latin letters of one byte each.
@@ -325,17 +326,65 @@ TEST(OtherMakers, MatroskaIsReadToItsEnd) {
     EXPECT_EQ(whole_movie::Probe(folder / "c.mp4")["format"]["tags"].value("artist", ""), "Anna;Ben");
 }
 
-/// FFmpeg does not know WebVTT as it is in Matroska.
-TEST(OtherMakers, SubtitlesOfAnUnknownCodecAreCalledSoAndLeftBehind) {
-    if (program::Run({"sh", "-c", "command -v mkvmerge"}).code != 0)
-        GTEST_SKIP() << "without mkvmerge";
-    const Folder folder;
+/// One second with WebVTT beside the pictures, as Matroska's own programs write it: what tells a cue's place
+/// and its name stand beside it.
+void MakeWebVtt(const Folder& folder) {
     test_movies::Ffmpeg(Join(CountedPictures(1), Args{folder / "pictures.mkv"}));
-    WriteFile(folder / "a.vtt", "WEBVTT\n\n00:00.200 --> 00:00.800\nGood morning\n");
+    WriteFile(folder / "a.vtt", "WEBVTT\n\nfirst\n00:00.200 --> 00:00.600 line:10% align:start\n"
+                                "Good <b>morning</b> &amp; all\n\n00:00.700 --> 00:00.900\nplain\n");
     ASSERT_EQ(
         program::Run({"mkvmerge", "-q", "-o", folder / "in.mkv", folder / "pictures.mkv", folder / "a.vtt"})
             .code,
         0);
+}
+
+/// FFmpeg does not know WebVTT as it is in Matroska.
+TEST(OtherMakers, WebVttOfMatroskaIsCarriedAndDrawn) {
+    if (program::Run({"sh", "-c", "command -v mkvmerge"}).code != 0)
+        GTEST_SKIP() << "without mkvmerge";
+    const Folder folder;
+    MakeWebVtt(folder);
+    const std::string told = Call({"--info", folder / "in.mkv"}).out;
+    EXPECT_NE(told.find("subtitles  webvtt, text, default\n"), std::string::npos) << told;
+    struct Case {
+        const char* name;
+        const char* codec;
+        bool hasPlaces;
+    };
+    for (const auto& [name, codec, hasPlaces] :
+         {Case{"a.mkv", "webvtt", true}, Case{"a.mp4", "mov_text", false}, Case{"a.webm", "webvtt", true}}) {
+        SCOPED_TRACE(name);
+        const Result made = Call({folder / "in.mkv", folder / name, "--progress", "none"});
+        EXPECT_EQ(made.code, 0);
+        EXPECT_EQ(made.err, "");
+        EXPECT_EQ(whole_movie::Probe(folder / name)["streams"][1].value("codec_name", ""), codec);
+        const std::vector<whole_movie::Cue> cues = whole_movie::CuesOf(folder / name, 0);
+        ASSERT_EQ(cues.size(), 2);
+        EXPECT_NEAR(cues[0].begin, 200, 1);
+        EXPECT_NEAR(cues[0].end, 600, 1);
+        EXPECT_EQ(cues[0].text, "Good morning & all");
+        EXPECT_EQ(cues[1].text, "plain");
+        EXPECT_EQ(Has(ReadFile(folder / name), "first\nline:10% align:start\nGood"), hasPlaces);
+    }
+    const auto pictures = [&](const Args& options) {
+        const Result made = Call(Join(Args{folder / "in.mkv", folder / "drawn.mkv", "--video-codec", "FFV1",
+                                           "--overwrite", "--progress", "none"},
+                                      options));
+        EXPECT_EQ(made.code, 0) << made.err;
+        return test_movies::FfmpegReads(folder / "drawn.mkv", Words("-map 0:v -f rawvideo"));
+    };
+    EXPECT_NE(pictures({"--burn-subtitles", "1"}), pictures({}));
+}
+
+TEST(OtherMakers, SubtitlesOfAnUnknownCodecAreCalledSoAndLeftBehind) {
+    if (program::Run({"sh", "-c", "command -v mkvmerge"}).code != 0)
+        GTEST_SKIP() << "without mkvmerge";
+    const Folder folder;
+    MakeWebVtt(folder);
+    const std::string codec = "S_TEXT/WEBVTT";
+    std::string movie = ReadFile(folder / "in.mkv");
+    ASSERT_NE(movie.find(codec), std::string::npos);
+    WriteFile(folder / "in.mkv", movie.replace(movie.find(codec), codec.size(), "S_TEXT/NEWEST"));
     const std::string told = Call({"--info", folder / "in.mkv"}).out;
     EXPECT_NE(told.find("subtitles  unknown, default, no decoder\n"), std::string::npos) << told;
     const Result made = Call({folder / "in.mkv", folder / "out.mkv", "--progress", "none"});
