@@ -2,6 +2,7 @@
 
 #include "ffmpeg/Mp4Box.h"
 #include "host/source/ContainerParts.h"
+#include "host/source/MatroskaEnd.h"
 
 #include <algorithm>
 #include <array>
@@ -114,6 +115,16 @@ bool IsCutOff(const InputFile& file, AVFormatContext& context) {
     if (av_match_name("asf", format) != 0)
         return ObjectsAreCutOff(file);
     return (av_match_name("avi", format) != 0 || av_match_name("wav", format) != 0) && ChunkIsCutOff(file);
+}
+
+std::vector<std::optional<double>> LastPackets(const InputFile& file, const AVFormatContext& context) {
+    std::vector<std::optional<double>> last;
+    if (av_match_name("matroska", context.iformat->name) != 0)
+        last = ReadMatroskaEnd(file);
+    if (last.size() > context.nb_streams) // streams and tracks do not belong to each other
+        last.clear();
+    last.resize(context.nb_streams);
+    return last;
 }
 
 std::optional<Shortfall> FindShortfall(const Promise& promise, const Reached& reached) {

@@ -6,6 +6,7 @@
 #include "host/source/InputFile.h"
 
 #include <optional>
+#include <vector>
 
 namespace movieconv {
 
@@ -30,6 +31,11 @@ struct Shortfall {
     double announced = 0; ///< Seconds of the stream that ended early; 0 when nothing but the cut tells.
     double reached = 0;
 };
+
+/// When the last packet of each stream begins, in seconds on the container's clock, where the file's
+/// structure shows that, whatever its texts and its length say: Matroska counts how long a last picture stays
+/// only there. Nothing where it does not, or the file is not whole.
+std::vector<std::optional<double>> LastPackets(const InputFile& file, const AVFormatContext& context);
 
 /// Whether the container's outermost elements end behind the file's last byte, or an index entry of the
 /// streams does. False for what has no size.

@@ -7,15 +7,7 @@
 #include <cstddef>
 
 namespace movieconv {
-namespace {
-
-/// A number of Matroska's: the zeros in front of its first bit tell how many bytes it has.
-struct Marked {
-    uint64_t value = 0;
-    int length = 0; // 0 when it makes no sense
-};
-
-Marked ReadMarked(const uint8_t* bytes, int mostBytes, bool keepMark) {
+MarkedNumber ReadMarkedNumber(const uint8_t* bytes, int mostBytes, bool keepMark) {
     int length = 1;
     while (length <= mostBytes && (bytes[0] & (0x80 >> (length - 1))) == 0)
         ++length;
@@ -26,8 +18,6 @@ Marked ReadMarked(const uint8_t* bytes, int mostBytes, bool keepMark) {
         value = value << 8 | bytes[i];
     return {value, length};
 }
-
-} // namespace
 
 std::optional<PartHead> ReadBoxHead(const InputFile& file, int64_t at) {
     std::array<uint8_t, av::BoxHead::kMostSize> bytes{};
@@ -43,8 +33,9 @@ std::optional<PartHead> ReadElementHead(const InputFile& file, int64_t at) {
     std::array<uint8_t, 12> head{}; // what is not read stays 0
     if (file.ReadAt(at, head.data(), head.size()) < 2)
         return std::nullopt;
-    const Marked name = ReadMarked(head.data(), 4, true);
-    const Marked size = name.length > 0 ? ReadMarked(head.data() + name.length, 8, false) : Marked{};
+    const MarkedNumber name = ReadMarkedNumber(head.data(), 4, true);
+    const MarkedNumber size =
+        name.length > 0 ? ReadMarkedNumber(head.data() + name.length, 8, false) : MarkedNumber{};
     if (size.length == 0)
         return std::nullopt;
     const int64_t headSize = name.length + size.length;

@@ -22,6 +22,15 @@ struct PartHead {
                       ///< holds it.
 };
 
+/// A number of Matroska's: the zeros in front of its first bit tell how many bytes it has.
+struct MarkedNumber {
+    uint64_t value = 0;
+    int length = 0; ///< Bytes; 0 when there are more than allowed.
+};
+
+/// `bytes` are as many as are allowed; the first bit is part of the value if `keepMark`.
+MarkedNumber ReadMarkedNumber(const uint8_t* bytes, int mostBytes, bool keepMark);
+
 /// Nothing where no head is whole at that place of the file, or it makes no sense.
 std::optional<PartHead> ReadBoxHead(const InputFile& file, int64_t at);
 std::optional<PartHead> ReadElementHead(const InputFile& file, int64_t at);

@@ -1,7 +1,7 @@
 #include "host/source/ContainerNotes.h"
 
-#include "host/source/ContainerParts.h"
 #include "host/source/Languages.h"
+#include "host/source/MatroskaSegment.h"
 
 #include <algorithm>
 #include <array>
@@ -12,17 +12,7 @@
 namespace movieconv {
 namespace {
 
-constexpr uint64_t kSegment = 0x18538067;
-constexpr uint64_t kSeekHead = 0x114D9B74;
-constexpr uint64_t kSeek = 0x4DBB;
-constexpr uint64_t kSeekId = 0x53AB;
-constexpr uint64_t kSeekPosition = 0x53AC;
-constexpr uint64_t kCluster = 0x1F43B675;
-constexpr uint64_t kInfo = 0x1549A966;
 constexpr uint64_t kTitle = 0x7BA9;
-constexpr uint64_t kTracks = 0x1654AE6B;
-constexpr uint64_t kTrack = 0xAE;
-constexpr uint64_t kTrackType = 0x83;
 constexpr uint64_t kTrackLanguage = 0x22B59D;
 constexpr uint64_t kTrackCodec = 0x86;
 constexpr uint64_t kChapters = 0x1043A770;
@@ -57,18 +47,17 @@ AVCodecID CodecNamed(const std::string& name) {
 /// What one file tells.
 class MatroskaReader {
 public:
-    explicit MatroskaReader(const InputFile& file)
-        : elements_(file, ReadElementHead), segment_(elements_.Find(elements_.Whole(), kSegment)) {}
+    explicit MatroskaReader(const InputFile& file) : segment_(file), elements_(segment_.Elements()) {}
 
     ContainerNotes Read() {
-        notes_.title = Text(Locate(kInfo), kTitle, kLongestName);
+        notes_.title = Text(segment_.Locate(kMatroskaInfo), kTitle, kLongestName);
         ReadTracks();
-        ForEach(Locate(kChapters), kEdition, [this](const Part& edition) {
+        segment_.ForEach(segment_.Locate(kChapters), kEdition, [this](const Part& edition) {
             if (notes_.chapters == 0)
                 CountDisordered(edition);
             ReadChapters(edition, 0);
         });
-        ForEach(Locate(kAttachments), kFile, [this](const Part& file) {
+        segment_.ForEach(segment_.Locate(kAttachments), kFile, [this](const Part& file) {
             if (std::string description = Text(file, kFileDescription, kLongestText); !description.empty())
                 notes_.files.push_back({Text(file, kFileName, kLongestName), std::move(description)});
         });
@@ -77,45 +66,15 @@ public:
     }
 
 private:
-    /// Calls `take` with those parts of `whole` that have that name.
-    template <class Take>
-    void ForEach(const Part& whole, uint64_t name, Take take) {
-        elements_.ForEach(whole, [&](const Part& part) {
-            if (part.name == name)
-                take(part);
-            return true;
-        });
-    }
-
     std::string Text(const Part& whole, uint64_t name, int64_t most) {
         return elements_.Text(elements_.Find(whole, name), 0, most);
     }
 
-    /// A part of the segment: in front of the packets, or where the list of parts has it.
-    Part Locate(uint64_t name) {
-        if (const Part found = elements_.Find(segment_, name, kCluster); found.name == name)
-            return found;
-        Part located;
-        ForEach(elements_.Find(segment_, kSeekHead, kCluster), kSeek, [&](const Part& seek) {
-            const uint64_t place = elements_.Number(elements_.Find(seek, kSeekPosition));
-            if (elements_.Number(elements_.Find(seek, kSeekId)) != name ||
-                place >= static_cast<uint64_t>(segment_.end - segment_.begin))
-                return;
-            const Part part = elements_.At(segment_.begin + static_cast<int64_t>(place), segment_.end);
-            if (part.name == name)
-                located = part;
-        });
-        return located;
-    }
-
     void ReadTracks() {
-        constexpr std::array<uint64_t, 4> kTypes{1, 2, 0x11, 0x21}; // of those that become streams
-        ForEach(Locate(kTracks), kTrack, [&](const Part& track) {
-            const uint64_t type = elements_.Number(elements_.Find(track, kTrackType));
-            if (std::find(kTypes.begin(), kTypes.end(), type) != kTypes.end())
-                notes_.streams.push_back({LanguageTagFrom(Text(track, kTrackLanguage, kLongestLanguage)),
-                                          {},
-                                          CodecNamed(Text(track, kTrackCodec, kLongestName))});
+        segment_.ForEachTrack([this](const Part& track) {
+            notes_.streams.push_back({LanguageTagFrom(Text(track, kTrackLanguage, kLongestLanguage)),
+                                      {},
+                                      CodecNamed(Text(track, kTrackCodec, kLongestName))});
         });
     }
 
@@ -124,7 +83,7 @@ private:
         constexpr int kDeepest = 8;
         if (depth == kDeepest)
             return;
-        ForEach(whole, kChapter, [&](const Part& chapter) {
+        segment_.ForEach(whole, kChapter, [&](const Part& chapter) {
             ++notes_.chapters;
             if (depth == 0)
                 ReadTitles(chapter);
@@ -135,7 +94,7 @@ private:
     /// FFmpeg leaves out what does not begin behind all it has read.
     void CountDisordered(const Part& edition) {
         uint64_t latest = 0;
-        ForEach(edition, kChapter, [&](const Part& chapter) {
+        segment_.ForEach(edition, kChapter, [&](const Part& chapter) {
             const uint64_t begin = elements_.Number(elements_.Find(chapter, kChapterBegin));
             notes_.disordered += latest != 0 && begin <= latest ? 1 : 0;
             latest = std::max(latest, begin);
@@ -144,7 +103,7 @@ private:
 
     void ReadTitles(const Part& chapter) {
         std::vector<std::string> titles;
-        ForEach(chapter, kChapterDisplay, [&](const Part& display) {
+        segment_.ForEach(chapter, kChapterDisplay, [&](const Part& display) {
             std::string title = Text(display, kChapterTitle, kLongestName);
             if (!title.empty() && std::find(titles.begin(), titles.end(), title) == titles.end())
                 titles.push_back(std::move(title));
@@ -156,7 +115,7 @@ private:
     /// Of the texts about the movie, those that come again under a key that FFmpeg has for one of them.
     void ReadTags() {
         std::map<std::string, std::vector<std::string>> texts;
-        ForEach(Locate(kTags), kTag, [&](const Part& tag) {
+        segment_.ForEach(segment_.Locate(kTags), kTag, [&](const Part& tag) {
             const Part targets = elements_.Find(tag, kTargets);
             const bool isOfAPart =
                 std::any_of(kTargetsWithin.begin(), kTargetsWithin.end(), [&](uint64_t target) {
@@ -164,7 +123,7 @@ private:
                 });
             const std::string type = Text(targets, kTargetType, kLongestName);
             if (!isOfAPart)
-                ForEach(tag, kSimpleTag, [&](const Part& simple) {
+                segment_.ForEach(tag, kSimpleTag, [&](const Part& simple) {
                     std::vector<std::string>& known = texts[KeyOf(simple, type)];
                     std::string text = Text(simple, kTagText, kLongestText);
                     if (!text.empty() && std::find(known.begin(), known.end(), text) == known.end())
@@ -189,8 +148,8 @@ private:
                (language.empty() || language == "und" ? "" : "-" + language);
     }
 
-    Parts elements_;
-    const Part segment_;
+    MatroskaSegment segment_;
+    Parts& elements_;
     ContainerNotes notes_;
 };
 

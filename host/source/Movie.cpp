@@ -78,8 +78,31 @@ std::optional<Shortfall> Movie::Missing() const {
         ends.pictures = reached(Info().pictures->index);
     if (sound_ && sound_->RanDry())
         ends.sound = reached(Info().sound->index);
-    const std::optional<Shortfall> found = FindShortfall(Info().promise, ends);
+    std::optional<Shortfall> found = FindShortfall(Info().promise, ends);
+    if (found && !found->cutOff)
+        found = FindShortfall(ShownByStructure(), ends);
     return found ? found : LateShortfall(ends);
+}
+
+/// What the source promises, of which the length that a last picture is said to stay is not to be found in
+/// it.
+Promise Movie::ShownByStructure() const {
+    Promise promise = Info().promise;
+    const std::vector<std::optional<double>> last = source_.Reader().File().LastPackets();
+    const auto begin = [&](const auto& stream) -> std::optional<double> {
+        const std::optional<double> shown =
+            stream ? last[static_cast<std::size_t>(stream->index)] : std::nullopt;
+        return shown ? std::optional(*shown - ToSeconds(source_.Reader().Start())) : std::nullopt;
+    };
+    const std::optional<double> pictures = begin(Info().pictures);
+    const std::optional<double> sound = begin(Info().sound);
+    if (promise.pictures && pictures)
+        promise.pictures = std::min(*promise.pictures, *pictures);
+    if (promise.sound && sound)
+        promise.sound = std::min(*promise.sound, *sound);
+    if (promise.all && (pictures || sound))
+        promise.all = std::min(*promise.all, *std::max(pictures, sound));
+    return promise;
 }
 
 /// What goes on only in streams that are not converted, since they came up late.

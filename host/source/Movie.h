@@ -82,6 +82,7 @@ public:
     std::vector<Sentence> Complaints() const;
 
 private:
+    Promise ShownByStructure() const;
     std::optional<Shortfall> LateShortfall(const Reached& ends) const;
 
     const SourceChoice choice_;

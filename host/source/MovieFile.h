@@ -10,6 +10,7 @@
 
 #include <cstdint>
 #include <memory>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -37,6 +38,9 @@ public:
 
     /// Whether the file promises more than it holds.
     bool IsCutOff() const { return movieconv::IsCutOff(bytes_, *input_); }
+
+    /// See movieconv::LastPackets.
+    std::vector<std::optional<double>> LastPackets() const { return movieconv::LastPackets(bytes_, *input_); }
 
     /// What it says and FFmpeg does not read.
     ContainerNotes Notes() const { return ReadContainerNotes(bytes_, *input_); }

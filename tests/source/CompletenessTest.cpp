@@ -101,4 +101,38 @@ TEST(Sources, AreWholeWhenOnlyAnotherStreamPromisesMore) {
                                            Args{"-vf", "select='lt(n,1)+lt(n,20)'", "-fps_mode", "vfr"}))));
 }
 
+/// Two seconds in Matroska that are told to last ten, as the last picture does in the file that they come
+/// from. `isTagged`: so are the pictures, and not the movie alone.
+std::string Staying(bool isTagged) {
+    const std::string inMp4 = Make(
+        "long-last.mp4", Join(CountedPictures(12), Words("-an -c:v mpeg4 -vf select='lt(n,50)+eq(n,250)' "
+                                                         "-fps_mode vfr")));
+    std::string movie = ReadFile(Make("long-last.mkv", {"-i", inMp4, "-frames:v", "50", "-c", "copy"}));
+    const std::size_t tag = movie.find("DURATION");
+    EXPECT_NE(tag, std::string::npos);
+    return isTagged ? movie : movie.replace(tag, 8, "ANYTHING");
+}
+
+TEST(Sources, AreWholeWhenTheLastPictureOfMatroskaIsTold) {
+    const Folder folder;
+    const std::string path = folder / "told.mkv";
+    for (const bool isTagged : {true, false}) {
+        SCOPED_TRACE(isTagged);
+        const std::string movie = Staying(isTagged);
+        WriteFile(path, movie);
+        EXPECT_FALSE(MissingIn(path));
+        WriteFile(path, movie.substr(0, movie.size() - 1));
+        const std::optional<Shortfall> cut = MissingIn(path);
+        ASSERT_TRUE(cut);
+        EXPECT_TRUE(cut->cutOff);
+        // A download that has all its room and not all its bytes.
+        const std::size_t there = movie.size() * 6 / 10;
+        WriteFile(path, movie.substr(0, there) + std::string(movie.size() - there, '\0'));
+        const std::optional<Shortfall> missing = MissingIn(path);
+        ASSERT_TRUE(missing);
+        EXPECT_FALSE(missing->cutOff);
+        EXPECT_NEAR(missing->announced, 10, 0.1);
+    }
+}
+
 } // namespace
