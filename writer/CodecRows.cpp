@@ -80,6 +80,7 @@ constexpr std::array kPictureRows{
         .evenSize = true,
         .quality = kCrf63,
         .speed = kAv1Speeds,
+        .mostTold = 240,
     },
     PictureCodec{
         .code = kFfv1,

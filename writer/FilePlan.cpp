@@ -195,15 +195,27 @@ void SetTimes(PicturePlan& plan, const Container& container, const Carriage& car
         std::llround(static_cast<double>(kTicksPerSecond) / (sourceRate > 0.0 ? sourceRate : rate));
 }
 
-PicturePlan MakePicturePlan(const EncodeParam& param, const VideoFormat& source, const Container& container,
+/// Whether pictures keep the source's times, of which the engine is told another rate than they have.
+bool KeepsOtherRate(const EncodeParam& param, const VideoFormat& source, const Container& container,
+                    const Carriage& carriage, const WriterOptions& options) {
+    const double told = UsableRate(source.dFrameRate);
+    const double asked = UsableRate(param.dFrameRate);
+    return UsableRate(options.dSourceRate) > told && (asked <= 0 || SameRate(asked, told)) &&
+           options.bSteadyRate == 0 && container.kind != ContainerKind::kSteadyRate &&
+           !carriage.steadyPictures;
+}
+
+PicturePlan MakePicturePlan(EncodeParam param, VideoFormat source, const Container& container,
                             const WriterOptions& options) {
     PicturePlan plan{};
     plan.codec = FindPictureCodec(container, param.fccVideo);
     if (plan.codec == nullptr)
         throw WriterFailure(kWriterErrorCodec, "The format " + FormatText(param) + " cannot carry video \"" +
                                                    CodeText(param.fccVideo) + "\".");
-    plan.settings = MakePictureSettings(param, source, *plan.codec, options);
     const Carriage& carriage = FindCarriage(container, plan.codec->code);
+    if (KeepsOtherRate(param, source, container, carriage, options))
+        param.dFrameRate = source.dFrameRate = options.dSourceRate;
+    plan.settings = MakePictureSettings(param, source, *plan.codec, options);
     SetShape(plan, param, source, options);
     SetColours(plan, carriage, options);
     SetTimes(plan, container, carriage, source, options);

@@ -59,6 +59,7 @@ struct PictureCodec {
     const AVRational* rates = nullptr; ///< All that every player knows, rising, ended by 0; null: any rate.
     bool isBt601 = false; ///< Decoders know but the matrix of BT.601, whatever a container tells.
     double maxRate = 0;   ///< Most pictures a second that players show in time; 0: no limit.
+    double mostTold = 0;  ///< Most pictures a second that the encoder can be told; 0: any number.
     const char* otherOptions = nullptr; ///< For pictures that the encoder does not take with `options`.
 };
 

@@ -75,11 +75,20 @@ int64_t RateBeside(const QualityScale& scale, const PictureSettings& settings) {
     return 0;
 }
 
+/// Pictures a second, as many as the encoder takes.
+double RateTold(const PictureCodec& codec, const PictureSettings& settings) {
+    const double rate = av_q2d(settings.rate);
+    return codec.mostTold > 0 ? std::min(rate, codec.mostTold) : rate;
+}
+
+/// Where the encoder is told fewer pictures a second, each is to get no more bits for it.
 void SetRates(AVCodecContext& context, const PictureCodec& codec, const PictureSettings& settings) {
-    context.bit_rate = settings.quality ? RateBeside(codec.quality, settings) : settings.bitrate;
+    const double share = RateTold(codec, settings) / av_q2d(settings.rate);
+    const auto told = [&](int64_t rate) { return std::llround(static_cast<double>(rate) * share); };
+    context.bit_rate = told(settings.quality ? RateBeside(codec.quality, settings) : settings.bitrate);
     if (settings.maxBitrate <= 0)
         return;
-    context.rc_max_rate = std::max<int64_t>(settings.maxBitrate, context.bit_rate);
+    context.rc_max_rate = std::max<int64_t>(told(settings.maxBitrate), context.bit_rate);
     context.rc_buffer_size = static_cast<int>(std::min<int64_t>(context.rc_max_rate * 2, INT32_MAX));
     // SVT-AV1 takes equal ones for a constant rate, which it has only where pictures are coded in their
     // order.
@@ -105,7 +114,7 @@ av::CodecContext OpenWith(const PictureCodec& codec, const PictureSettings& sett
     context.height = settings.height;
     context.pix_fmt = settings.format;
     // Some codecs limit the terms of the rate to 16 bits.
-    context.framerate = av_d2q(av_q2d(settings.rate), 60000);
+    context.framerate = av_d2q(RateTold(codec, settings), 60000);
     context.time_base = av_inv_q(context.framerate);
     context.sample_aspect_ratio = settings.sampleAspect;
     SetRates(context, codec, settings);

@@ -198,6 +198,10 @@ typedef struct WriterOptions {
     /// the channels come. 0, or another number of them than there are channels: the usual ones of that
     /// number.
     uint64_t nChannelMask;
+    /// Pictures a second of a source of which the engine is told fewer, since it takes more than 200 for a
+    /// mistake. A file that keeps the source's own times tells this rate, and codes by it. 0: as the engine
+    /// is told.
+    double dSourceRate;
 } WriterOptions;
 
 /// What a piece holds.

@@ -46,6 +46,8 @@ WriterOptions OptionsFor(const Request& request, const SourceInfo& source) {
     if (source.pictures) {
         writer.nSampleAspectNum = source.pictures->pixelAspect.num;
         writer.nSampleAspectDen = source.pictures->pixelAspect.den;
+        if (source.pictures->frameRate > CredibleRate(*source.pictures))
+            writer.dSourceRate = source.pictures->frameRate;
     }
     if (const FileFormatInfo& format = ChooseFormat(request); source.pictures && format.bHasVideo != 0) {
         const PicturePlan plan = PlanPictures(request, format, *source.pictures);

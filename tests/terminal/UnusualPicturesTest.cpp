@@ -33,6 +33,24 @@ TEST(UnusualPictures, SlowMotionKeepsEveryPictureWithItsTime) {
     }
 }
 
+/// In the file's head, and in the bits that each picture gets.
+TEST(UnusualPictures, SlowMotionIsToldAndCodedByItsOwnRate) {
+    constexpr int kBitRate = 100'000;
+    const std::string source =
+        Make("480-a-second.mp4", Join(CountedPictures(3, "480"), Args{"-c:v", "mpeg4"}));
+    for (const char* const codec : {"H264", "HEVC", "AV1", "VP9"}) {
+        SCOPED_TRACE(codec);
+        const Folder folder;
+        const Result result = Call({"--preset", "classic", "--video-codec", codec, "--video-rate",
+                                    std::to_string(kBitRate), source, folder / "o.mkv"});
+        ASSERT_EQ(result.code, 0) << result.err;
+        EXPECT_EQ(Ffprobe(folder / "o.mkv", Words("-show_entries stream=avg_frame_rate -of csv=p=0")),
+                  "480/1\n");
+        EXPECT_LT(ReadFile(folder / "o.mkv").size() * 8, 3 * kBitRate * 2);
+        EXPECT_EQ(inspect::LookAt(folder / "o.mkv").pictures.size(), 3 * 480U);
+    }
+}
+
 TEST(UnusualPictures, FillTheirFrameWhereTheContainerAloneTellsTheirShape) {
     const Folder folder;
     for (const auto& [codec, name] :
