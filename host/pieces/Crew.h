@@ -91,6 +91,7 @@ protected:
     double Worked() const { return clock_.Seconds(); }
     /// Unless there is a pause or what is done stands still.
     void TickClock(bool stands = false);
+    void SkipClock() { clock_.Skip(WorkClock::Now()); } ///< What was done since then is no work.
     void TickAfterWait() { clock_.TickAfterWait(WorkClock::Now()); }
     Bell& Ringer() { return bell_; } ///< Wakes the crew's thread, as Stop does.
 

@@ -26,7 +26,7 @@
 namespace movieconv {
 namespace {
 
-double LengthOf(const Piece& piece) {
+double Seconds(const Piece& piece) {
     return ToSeconds(piece.end - piece.begin);
 }
 
@@ -123,10 +123,11 @@ Verdict Foreman::Perform() {
         return verdict_;
     plan_ = std::move(*plan);
     CheckAgainst(plan_);
+    Announce();
     missing_ = FindMissing();
     if (Stopped())
         return verdict_;
-    Announce();
+    TellWhatIsMade();
     verdict_.outcome = Outcome::kDone;
     WorkOff(missing_.empty() ? 0 : JobsFor());
     if (Stopped() && verdict_.outcome == Outcome::kDone)
@@ -176,16 +177,49 @@ std::optional<Plan> Foreman::Prepare() {
     return plan;
 }
 
-/// The numbers of the pieces that are to be made; the rest first, which takes longest.
-std::deque<int> Foreman::FindMissing() const {
+/// Seconds that a piece brings: the rest none, unless nothing else is made.
+double Foreman::LengthOf(int number) const {
     if (order_.only)
-        return FaultOf(plan_, order_.planPath, *order_.only).empty() ? std::deque<int>{}
-                                                                     : std::deque{*order_.only};
+        return length_;
+    return plan_.IsRest(number) ? 0 : Seconds(plan_.pictures[static_cast<std::size_t>(number)]);
+}
+
+/// While old pieces are read, of which nothing is made: false when that is to end. Waits in a pause.
+bool Foreman::GoesOnReading() {
+    SkipClock();
+    FollowWishes();
+    if (Paused()) {
+        TellReading(Phase::kPaused);
+        for (; Paused(); FollowWishes())
+            Ringer().Wait(std::nullopt);
+        TellReading(Phase::kConverting);
+    }
+    return !Stopped();
+}
+
+/// Tells the phase alone: how far everything is, and how fast it goes on, is not known before all are read.
+void Foreman::TellReading(Phase phase) {
+    Progress report;
+    report.phase = phase;
+    report.phaseChanged = true;
+    report.worked = Worked();
+    report.length = length_;
+    News().Progressed(report);
+}
+
+bool Foreman::IsMade(int number) {
+    return FaultOf(plan_, order_.planPath, number, [this] { return GoesOnReading(); }) == "";
+}
+
+/// The numbers of the pieces that are to be made; the rest first, which takes longest.
+std::deque<int> Foreman::FindMissing() {
+    if (order_.only)
+        return IsMade(*order_.only) ? std::deque<int>{} : std::deque{*order_.only};
     std::deque<int> missing;
     if (!order_.request) // the pieces were made elsewhere
         return missing;
     for (int number = plan_.Pieces() - 1; number >= 0 && !Stopped(); --number) // each is read whole
-        if (!FaultOf(plan_, order_.planPath, number).empty())
+        if (!IsMade(number))
             missing.push_back(number);
     std::sort(missing.begin(), missing.end());
     if (!missing.empty() && plan_.IsRest(missing.back())) {
@@ -196,23 +230,23 @@ std::deque<int> Foreman::FindMissing() const {
 }
 
 void Foreman::Announce() {
-    for (int number = 0; number < plan_.Pieces() - 1; ++number) {
-        if (order_.only && number != *order_.only)
-            continue;
-        const double length = LengthOf(plan_.pictures[static_cast<std::size_t>(number)]);
-        length_ += length;
-        if (std::find(missing_.begin(), missing_.end(), number) == missing_.end())
-            done_ += length;
-    }
-    if (order_.only && plan_.IsRest(*order_.only)) { // its progress is the sound's
+    for (int number = 0; number < plan_.Pieces() - 1; ++number)
+        if (!order_.only || number == *order_.only)
+            length_ += Seconds(plan_.pictures[static_cast<std::size_t>(number)]);
+    if (order_.only && plan_.IsRest(*order_.only)) // its progress is the sound's
         length_ = ToSeconds(plan_.pictures.back().end - plan_.pictures.front().begin);
-        done_ = missing_.empty() ? length_ : 0;
-    }
-    earlier_ = done_;
     News().Started({plan_.source.path, order_.only ? PiecePath(order_.planPath, *order_.only) : plan_.output,
                     length_, true});
     if (!leftover_.empty())
         News().Warned({Warning::Kind::kChosen, leftover_});
+}
+
+void Foreman::TellWhatIsMade() {
+    for (int number = 0; number < plan_.Pieces(); ++number)
+        if (number == order_.only.value_or(number) &&
+            std::find(missing_.begin(), missing_.end(), number) == missing_.end())
+            done_ += LengthOf(number);
+    earlier_ = done_;
     if (order_.only && missing_.empty())
         News().Warned({Warning::Kind::kChosen, fmt::format("piece {} is made already", *order_.only)});
     if (order_.request && order_.resume && static_cast<int>(missing_.size()) < plan_.Pieces())
@@ -246,9 +280,7 @@ Crew::Mood Foreman::HowToGoOn() const {
 std::optional<Crew::Assignment> Foreman::Next() {
     const int number = missing_.front();
     missing_.pop_front();
-    double length = order_.only ? length_ : 0; // the rest brings none, unless nothing else is made
-    if (!plan_.IsRest(number))
-        length = LengthOf(plan_.pictures[static_cast<std::size_t>(number)]);
+    const double length = LengthOf(number);
     const std::string file = NameInTheMaking(PiecePath(order_.planPath, number));
     const bool fromStart = plan_.fromStart || fromStart_.count(number) > 0;
     Request request = RequestOf(order_, plan_, number, file);

@@ -46,9 +46,14 @@ private:
     void Report() override;
 
     std::optional<Plan> Prepare();
-    std::deque<int> FindMissing() const;
+    double LengthOf(int number) const;
+    bool GoesOnReading();
+    void TellReading(Phase phase);
+    bool IsMade(int number);
+    std::deque<int> FindMissing();
     std::set<int> TakeLacking();
     void Announce();
+    void TellWhatIsMade();
     int JobsFor();
     Going FollowJoining(const Joining& latest);
     void JoinAll();

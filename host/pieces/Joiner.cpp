@@ -41,15 +41,17 @@ void CheckPieces(const Plan& plan, const std::string& planPath, Bell& bell,
     std::string faults;
     std::size_t count = 0;
     for (int number = 0; number < plan.Pieces(); ++number) {
-        const Joining latest{kCheckingShare * number / plan.Pieces(), 0};
-        Going going = follow(latest);
-        for (; going == Going::kPaused; going = follow(latest))
-            bell.Wait(std::nullopt);
-        if (going == Going::kEnds)
+        const auto goesOn = [&, latest = Joining{kCheckingShare * number / plan.Pieces(), 0}] {
+            Going going = follow(latest);
+            for (; going == Going::kPaused; going = follow(latest))
+                bell.Wait(std::nullopt);
+            return going == Going::kOn;
+        };
+        const std::optional<std::string> fault = FaultOf(plan, planPath, number, goesOn);
+        if (!fault)
             break;
-        const std::string fault = FaultOf(plan, planPath, number);
-        if (!fault.empty() && ++count <= kMostTold)
-            faults += (faults.empty() ? "" : "; ") + fault;
+        if (!fault->empty() && ++count <= kMostTold)
+            faults += (faults.empty() ? "" : "; ") + *fault;
     }
     if (count > kMostTold)
         faults += fmt::format("; and {} more", count - kMostTold);

@@ -26,6 +26,7 @@ namespace movieconv {
 namespace {
 
 constexpr std::size_t kDigits = 64;
+constexpr int64_t kReadAtOnce = 1 << 20;            // a piece can be as large as a movie
 constexpr std::string_view kPieceHead = "MCPIECE1"; // with which the media writer begins one
 
 /// The seal without its last line.
@@ -112,9 +113,10 @@ int64_t SealPiece(const std::string& file, const Plan& plan, const std::string& 
     }
 }
 
-std::string FaultOf(const Plan& plan, const std::string& planPath, int number) {
+std::optional<std::string> FaultOf(const Plan& plan, const std::string& planPath, int number,
+                                   const std::function<bool()>& goesOn) {
     const std::string path = PiecePath(planPath, number);
-    const auto fault = [&](const char* what) {
+    const auto fault = [&](const char* what) -> std::optional<std::string> {
         return fmt::format("piece {} (\"{}\") {}", number, path, what);
     };
     const text::Descriptor file = OpenForReading(path);
@@ -132,12 +134,16 @@ std::string FaultOf(const Plan& plan, const std::string& planPath, int number) {
         return fault(other != plan.hash ? "belongs to another plan" : "is another piece under its name");
     }
     Digest digest;
-    if (!AddFile(digest, file.Number(), 0, bytes))
-        return fault("cannot be read");
+    for (int64_t at = 0; at < bytes; at += kReadAtOnce) {
+        if (!goesOn())
+            return std::nullopt;
+        if (!AddFile(digest, file.Number(), at, std::min(kReadAtOnce, bytes - at)))
+            return fault("cannot be read");
+    }
     digest.Add(claim);
     if (digest.Hex() + "\n" != seal.substr(claim.size()))
         return fault("was changed since it was made");
-    return {};
+    return "";
 }
 
 void RequirePlaces(const std::string& planPath, const Request& request, std::optional<int> only) {

@@ -9,6 +9,7 @@
 #include "host/pieces/Plan.h"
 
 #include <cstdint>
+#include <functional>
 #include <optional>
 #include <string>
 
@@ -19,8 +20,10 @@ namespace movieconv {
 int64_t SealPiece(const std::string& file, const Plan& plan, const std::string& planPath, int number);
 
 /// What keeps a file from being that piece of the plan, a clause that begins with its name; empty when it is.
-/// Reads all of it.
-std::string FaultOf(const Plan& plan, const std::string& planPath, int number);
+/// Reads all of it, and asks `goesOn` again and again meanwhile, which may have it wait; nothing once that is
+/// false.
+std::optional<std::string> FaultOf(const Plan& plan, const std::string& planPath, int number,
+                                   const std::function<bool()>& goesOn);
 
 /// Throws Failure when something that is no piece, or that `request` reads, has the place of a piece of a
 /// plan of that name: of this one, or of any.

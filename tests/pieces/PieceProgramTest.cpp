@@ -1,5 +1,8 @@
 // The program's plans, pieces and joins, as a farm and as people use them.
+#include "host/pieces/Foreman.h"
 #include "host/pieces/Joiner.h"
+#include "host/pieces/PieceFile.h"
+#include "host/pieces/PieceRequest.h"
 #include "host/pieces/PlanText.h"
 #include "tests/pieces/ExitCodes.h"
 #include "tests/pieces/Packets.h"
@@ -11,7 +14,9 @@
 
 #include <filesystem>
 #include <fmt/format.h>
+#include <future>
 #include <string>
+#include <utility>
 #include <vector>
 
 namespace {
@@ -368,6 +373,51 @@ TEST(Pieces, AreNeitherCheckedNorJoinedDuringAPause) {
     EXPECT_EQ(verdict.outcome, movieconv::Outcome::kDone);
     EXPECT_GT(checking, kQuestions);
     EXPECT_GT(joining, kQuestions) << "it did not wait";
+}
+
+TEST(Pieces, ThatAreReadAreLeftAloneInTheMiddle) {
+    const Planned farm;
+    ASSERT_EQ(farm.Make(0).code, 0);
+    const movieconv::Plan plan = movieconv::ReadPlan(farm.plan);
+    EXPECT_EQ(movieconv::FaultOf(plan, farm.plan, 0, [] { return true; }), "");
+    EXPECT_EQ(movieconv::FaultOf(plan, farm.plan, 0, [] { return false; }), std::nullopt);
+}
+
+/// Hears of a pause and of what is made already.
+struct Waiting : movieconv::Observer {
+    std::promise<void> paused;
+    bool told = false;
+    std::string warnings;
+
+    void Progressed(const movieconv::Progress& news) override {
+        if (news.phase == movieconv::Phase::kPaused && !std::exchange(told, true))
+            paused.set_value();
+    }
+    void Warned(const movieconv::Warning& news) override { warnings += news.text + "\n"; }
+    void Ended(const movieconv::Verdict& /*news*/) override {}
+};
+
+TEST(Pieces, OfAnEarlierRunAreNotReadDuringAPause) {
+    const Planned farm;
+    movieconv::PieceOrder order;
+    order.planPath = farm.output + ".plan";
+    ASSERT_EQ(Call({"-q", "--plan", order.planPath, "--pieces", "4", Source(), farm.output}).code, 0);
+    for (const char* number : {"0", "1"})
+        ASSERT_EQ(Call({"-q", "--piece", number, order.planPath}).code, 0);
+    order.request = movieconv::WholeRequest(movieconv::ReadPlan(order.planPath));
+    order.division.pieces = 4;
+    order.resume = true;
+    Waiting observer;
+    movieconv::Foreman foreman(order, observer, {});
+    foreman.Pause();
+    foreman.Start();
+    observer.paused.get_future().wait();
+    std::filesystem::remove(fmt::format("{}.{:04}.piece", order.planPath, 0)); // the last one to be read
+    foreman.Resume();
+    foreman.Wait();
+    ASSERT_NE(foreman.Result(), nullptr);
+    EXPECT_EQ(foreman.Result()->outcome, movieconv::Outcome::kDone);
+    EXPECT_TRUE(Has(observer.warnings, "1 of 5 pieces are made already")) << observer.warnings;
 }
 
 TEST(Pieces, CostNothingWhereThereIsOne) {
