@@ -31,7 +31,6 @@ constexpr double kLeastPictureRate = 4000;
 // What a container adds.
 constexpr double kHeadBits = 16384 * 8;
 constexpr double kPacketBits = 48 * 8;
-constexpr double kSamplesPerPacket = 1024;
 constexpr double kShare = 0.96;
 constexpr double kPacketStreamShare = 0.85; // of formats that cut all into small packets
 
@@ -119,6 +118,56 @@ void FitPictures(Request& request, const FileFormatInfo& format, const PictureSt
     request.size = Size{shorter(size.width), shorter(size.height)};
 }
 
+/// Bytes of the covers and attached files that go into the output as they are.
+int64_t StoredBytes(const Request& request, const FileFormatInfo& format, const SourceInfo& source) {
+    const CarryPlan plan(source, request, format);
+    int64_t bytes = 0;
+    bool hasCover = false;
+    for (const StreamInfo& stream : source.streams) {
+        const bool isCover = stream.kind == StreamKind::kCover;
+        const bool isOneTooMany = isCover && hasCover && !Has(format, kWriterFormatAttachments);
+        if ((isCover || stream.kind == StreamKind::kAttachment) && !isOneTooMany &&
+            plan.WhyItStays(stream).empty()) {
+            bytes += stream.bytes;
+            hasCover = hasCover || isCover;
+        }
+    }
+    return bytes;
+}
+
+double SamplesPerPacket(const Request& request, const FileFormatInfo& format, const SourceInfo& source) {
+    const auto isAc3 = [&] {
+        if (!request.copySound)
+            return PlanSound(request, format, *source.sound).codec == FourCC("AC3 ");
+        const std::string& codec = source.streams.at(static_cast<std::size_t>(source.sound->index)).codec;
+        return codec == "ac3" || codec == "eac3";
+    };
+    return isAc3() ? 1536 : 1024; // other codecs have about as many
+}
+
+/// Packets a second of pictures and sound.
+double PacketRate(const Request& request, const FileFormatInfo& format, const SourceInfo& source,
+                  double pictureRate) {
+    const auto tracks = static_cast<double>(1 + CarryPlan(source, request, format).FurtherSound().size());
+    const bool pictures = source.pictures && format.bHasVideo != 0;
+    const bool sound = source.sound && format.bHasAudio != 0;
+    const double perTrack = sound ? source.sound->sampleRate / SamplesPerPacket(request, format, source) : 0;
+    return (pictures ? pictureRate : 0) + tracks * perTrack;
+}
+
+/// What becomes of so many bytes a second in a format that cuts all into small packets.
+double InSmallPackets(const FileFormatInfo& format, double bytes, double packets) {
+    constexpr double kPackBytes = 2048; // of a program stream
+    constexpr double kPackContent = 2019;
+    constexpr double kContent = 184;     // of a transport stream's packet
+    constexpr double kHead = 14;         // of a picture or a piece of sound, whose last packet is half empty
+    constexpr double kTables = 20 * 184; // ten times a second two tables, a packet each
+    if (format.fccFormat == FourCC("MPG "))
+        return bytes * kPackBytes / kPackContent;
+    const double packet = format.fccFormat == FourCC("M2TS") ? 192 : 188;
+    return (bytes + packets * (kHead + kContent / 2) + kTables) * packet / kContent;
+}
+
 } // namespace
 
 Request FitIntoSize(Request request, const SourceInfo& source) {
@@ -136,10 +185,10 @@ Request FitIntoSize(Request request, const SourceInfo& source) {
         throw Failure(Category::kRequest, Say("a codec without a bit rate cannot keep below a size"));
     const bool packets = Has(format, kWriterFormatSmallPackets);
     const auto tracks = static_cast<double>(1 + CarryPlan(source, request, format).FurtherSound().size());
-    const double packetRate = (pictures ? source.pictures->peakRate : 0) +
-                              (sound ? tracks * source.sound->sampleRate / kSamplesPerPacket : 0);
-    const double free = static_cast<double>(*request.maxSize) * 8 * (packets ? kPacketStreamShare : kShare) -
-                        kHeadBits - packetRate * length * kPacketBits;
+    const double packetRate = PacketRate(request, format, source, pictures ? source.pictures->peakRate : 0);
+    const int64_t room = *request.maxSize - StoredBytes(request, format, source);
+    const double free = static_cast<double>(room) * 8 * (packets ? kPacketStreamShare : kShare) - kHeadBits -
+                        packetRate * length * kPacketBits;
     const double share = free / length * (pictures ? kMostSoundShare : 1 / kSoundSpread) / tracks;
     const double soundRate = sound ? tracks * FitSound(request, format, *source.sound, share) : 0;
     const double pictureRate = (free - soundRate * length) / (length + kBufferSeconds);
@@ -167,7 +216,16 @@ std::optional<int64_t> NeededBytes(EncodeParam param, const Request& request, co
         param.nAudioMaxBitrate =
             static_cast<int32_t>(std::min<double>(param.nAudioMaxBitrate * tracks, INT32_MAX));
     }
-    return MCGetEstimateDiskSpaceEx(&param, length);
+    int64_t bytes = MCGetEstimateDiskSpaceEx(&param, length);
+    if (Has(format, kWriterFormatSmallPackets) && length > 0) {
+        const double pictureRate = source.pictures ? PlanPictures(request, format, *source.pictures)
+                                                         .frameRate.value_or(source.pictures->frameRate)
+                                                   : 0;
+        const double rate = InSmallPackets(format, static_cast<double>(bytes) / length,
+                                           PacketRate(request, format, source, pictureRate));
+        bytes = std::llround(rate * length);
+    }
+    return bytes + StoredBytes(request, format, source);
 }
 
 Sentence TellSize(const Request& fitted) {

@@ -181,6 +181,34 @@ TEST(NeededBytes, CountAllTracksAndAreNotKnownWhereSoundDecides) {
     }
 }
 
+TEST(NeededBytes, CountWhatIsStoredWhereItIsCarried) {
+    constexpr int64_t kMega = 1'000'000;
+    SourceInfo source = Source(10);
+    source.sound.reset();
+    for (const auto& [kind, bytes] : {std::pair{StreamKind::kPictures, int64_t{0}},
+                                      {StreamKind::kAttachment, 5 * kMega},
+                                      {StreamKind::kCover, kMega},
+                                      {StreamKind::kCover, 2 * kMega}}) {
+        StreamInfo stream;
+        stream.index = static_cast<int>(source.streams.size());
+        stream.kind = kind;
+        stream.bytes = bytes;
+        source.streams.push_back(stream);
+    }
+    EncodeParam param{};
+    param.bNoAudio = 1;
+    param.nVideoBitrate = 800'000;
+    for (const auto& [output, stored] :
+         {std::pair{"o.mkv", 8 * kMega}, {"o.mp4", kMega}, {"o.avi", int64_t{0}}}) {
+        SCOPED_TRACE(output);
+        Request request = To(output);
+        EXPECT_EQ(NeededBytes(param, request, source, 10), kMega + stored);
+        request.maxSize = 10 * kMega;
+        const Request fitted = FitIntoSize(request, source);
+        EXPECT_LT(fitted.videoRate.value_or(0) / 8.0 * 10, static_cast<double>(10 * kMega - stored));
+    }
+}
+
 TEST(CodecPlan, RefusesWhatFormatOrCodecDoesNotHave) {
     const std::pair codec{Category::kRequest, Reason::kCodec};
     const std::pair other{Category::kRequest, Reason::kOther};

@@ -11,6 +11,7 @@
 #include <algorithm>
 #include <csignal>
 #include <filesystem>
+#include <nlohmann/json.hpp>
 
 namespace {
 
@@ -218,6 +219,23 @@ TEST(Program, KeepsAPreview) {
     EXPECT_EQ(without.code, 0);
     EXPECT_NE(without.err.find("nowhere/now.png\": No such file"), std::string::npos) << without.err;
     EXPECT_EQ(without.out.find("100% done"), 0u) << without.out;
+}
+
+/// Sound that stays as it is has a size that is known: what is left is what the format adds.
+TEST(Program, EstimatesCountThePacketsOfStreamsForBroadcast) {
+    for (const auto& [name, codec] : {std::pair{"o.ts", "ac3"}, {"o.m2ts", "ac3"}, {"o.mpg", "mp2"}}) {
+        SCOPED_TRACE(name);
+        const Folder folder;
+        const std::string source = Make(std::string("estimated-") + codec + ".mkv",
+                                        Join(Beeps(20), Args{"-c:a", codec, "-b:a", "192k"}));
+        const Args order{source, folder / name, "--audio-codec", "copy", "--progress", "json"};
+        const Result estimate = Call(Join(Args{"--estimate"}, order));
+        ASSERT_EQ(estimate.code, 0) << estimate.err;
+        ASSERT_EQ(Call(order).code, 0);
+        const auto needed = nlohmann::json::parse(estimate.out).at("needed").get<double>();
+        const auto bytes = static_cast<double>(fs::file_size(folder / name));
+        EXPECT_NEAR(needed, bytes, 0.03 * bytes);
+    }
 }
 
 TEST(Program, TellsAboutSourcesFormatsAndRoom) {
