@@ -9,7 +9,8 @@ namespace movieconv {
 
 enum class LogWeight { kError, kWarning, kOther };
 
-/// While it lives, the lines of this process go to it and nowhere else. One at a time.
+/// While it lives, the lines of this process go to it and nowhere else, but for those about PictureAt, which
+/// go nowhere. One at a time.
 class LogTap {
 public:
     /// UTF-8 without a line end. Called on any thread, also on several at once; must return soon.

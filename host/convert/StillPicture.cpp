@@ -2,12 +2,14 @@
 
 #include "host/convert/PictureTap.h"
 #include "host/convert/Sources.h"
+#include "host/source/LogSilence.h"
 
 #include <chrono>
 
 namespace movieconv {
 
 std::shared_ptr<const ShownPicture> PictureAt(const std::string& path, double seconds) {
+    const LogSilence silence; // or they would stand among what a conversion says
     Request request;
     request.input = path;
     request.noAudio = true;

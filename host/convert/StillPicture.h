@@ -10,7 +10,8 @@
 namespace movieconv {
 
 /// The picture that the movie `path` shows `seconds` after its start; null when it shows none there. Opens
-/// the movie and decodes from the key picture before. Throws Failure.
+/// the movie and decodes from the key picture before; what is wrong with it goes to no LogTap. Throws
+/// Failure.
 std::shared_ptr<const ShownPicture> PictureAt(const std::string& path, double seconds);
 
 } // namespace movieconv

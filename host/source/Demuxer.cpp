@@ -1,6 +1,7 @@
 #include "host/source/Demuxer.h"
 
 #include "host/sentence/Say.h"
+#include "host/source/LogSilence.h"
 #include "host/source/MediaTime.h"
 #include "host/source/PacketTime.h"
 
@@ -59,7 +60,7 @@ bool Demuxer::Seek(double seconds) {
 
 void Demuxer::Start() {
     if (!started_ && !stopping_) {
-        thread_ = NewThread([this] { Run(); });
+        thread_ = NewThread(AsSilentAsHere([this] { Run(); }));
         started_ = true;
     }
 }

@@ -1,5 +1,6 @@
 #include "host/source/PictureDecoder.h"
 
+#include "host/source/LogSilence.h"
 #include "host/source/MediaTime.h"
 
 #include <algorithm>
@@ -71,7 +72,8 @@ void PictureDecoder::EndAt(double seconds) {
 
 VideoImage* PictureDecoder::GetCurrentImage() {
     if (!ended_ && !current_.frame) {
-        ended_ = !failures_.Attempt([this] { thread_ = NewThread([this] { Run(); }); }) || !Advance();
+        ended_ = !failures_.Attempt([this] { thread_ = NewThread(AsSilentAsHere([this] { Run(); })); }) ||
+                 !Advance();
     }
     return ended_ ? nullptr : &image_;
 }

@@ -1,6 +1,7 @@
 #include "host/source/StreamDecoder.h"
 
 #include "host/sentence/Say.h"
+#include "host/source/LogSilence.h"
 #include "host/source/SourceError.h"
 
 namespace movieconv {
@@ -11,6 +12,8 @@ StreamDecoder::StreamDecoder(const AVCodecParameters& parameters, AVRational tim
     context_->pkt_timebase = timeBase;
     context_->thread_count = threads;
     context_->thread_type = FF_THREAD_FRAME | FF_THREAD_SLICE;
+    if (LogSilence::Holds()) // its threads are not ours
+        context_->log_level_offset = AV_LOG_MAX_OFFSET;
     const int result = avcodec_open2(context_.get(), context_->codec, nullptr);
     av::CheckMemory(result);
     if (result < 0) {

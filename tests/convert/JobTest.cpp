@@ -1,4 +1,6 @@
 // One conversion as a library: its news, its control, what befalls its files.
+#include "host/convert/LogTap.h"
+#include "host/convert/StillPicture.h"
 #include "media/FourCC.h"
 #include "tests/convert/Listener.h"
 #include "tests/support/Inspect.h"
@@ -32,6 +34,39 @@ Request Converting(const std::string& input, const std::string& output) {
 
 std::string TextOf(const Verdict& verdict) {
     return verdict.failure ? verdict.failure->Text() : "";
+}
+
+/// A movie whose pictures are damaged from the second one on.
+void MakeDamaged(const std::string& path) {
+    std::string movie =
+        ReadFile(Make("to-be-damaged.mkv", Join(CountedPictures(4), Words("-c:v libx264 -g 10 -bf 2"))));
+    for (std::size_t at = movie.size() / 4; at < movie.size() * 3 / 4; at += 50)
+        movie[at] = static_cast<char>(movie[at] ^ 0x55);
+    WriteFile(path, movie);
+}
+
+TEST(LogTap, HearsOfConversionsAndNotOfSinglePictures) {
+    const Folder folder;
+    const std::string path = folder / "damaged.mkv";
+    MakeDamaged(path);
+    std::mutex mutex;
+    std::string lines;
+    const LogTap tap([&](LogWeight weight, const std::string& line) {
+        const std::lock_guard lock(mutex);
+        lines += weight != LogWeight::kOther ? line + "\n" : "";
+    });
+    for (const double seconds : {0.0, 1.0, 1.9, 2.5, 3.9})
+        PictureAt(path, seconds);
+    {
+        const std::lock_guard lock(mutex);
+        EXPECT_EQ(lines, "");
+    }
+    Listener listener;
+    Job job(Converting(path, folder / "out.mkv"), listener, {});
+    job.Start();
+    job.Wait();
+    const std::lock_guard lock(mutex);
+    EXPECT_NE(lines, "");
 }
 
 TEST(Job, TellsEverythingOnTheObserversThread) {
