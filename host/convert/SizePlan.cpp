@@ -127,7 +127,7 @@ int64_t StoredBytes(const Request& request, const FileFormatInfo& format, const 
         const bool isCover = stream.kind == StreamKind::kCover;
         const bool isOneTooMany = isCover && hasCover && !Has(format, kWriterFormatAttachments);
         if ((isCover || stream.kind == StreamKind::kAttachment) && !isOneTooMany &&
-            plan.WhyItStays(stream).empty()) {
+            plan.WhyItStays(stream).IsEmpty()) {
             bytes += stream.bytes;
             hasCover = hasCover || isCover;
         }

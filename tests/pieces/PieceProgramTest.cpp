@@ -393,7 +393,7 @@ struct Waiting : movieconv::Observer {
         if (news.phase == movieconv::Phase::kPaused && !std::exchange(told, true))
             paused.set_value();
     }
-    void Warned(const movieconv::Warning& news) override { warnings += news.text + "\n"; }
+    void Warned(const movieconv::Warning& news) override { warnings += news.text.Text() + "\n"; }
     void Ended(const movieconv::Verdict& /*news*/) override {}
 };
 
