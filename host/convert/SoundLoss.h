@@ -3,10 +3,10 @@
 #define MOVIECONV_HOST_CONVERT_SOUNDLOSS_H
 
 #include "host/convert/Request.h"
+#include "host/sentence/Sentence.h"
 #include "host/source/SourceInfo.h"
 #include "media/EncodeParam.h"
 
-#include <string>
 #include <vector>
 
 namespace movieconv {
