@@ -272,7 +272,8 @@ std::vector<TrackPlan> MakeTrackPlans(const EncodeParam& param, const FilePlan& 
 /// Seconds that the file will last, about; 0 when that is not known.
 double ExpectedLength(const FilePlan& plan, const VideoFormat* video, const AudioFormat* audio,
                       double fileLength) {
-    double length = plan.pictures ? double{video->dDuration} : 0; // copies: the records are packed
+    double length =
+        plan.pictures && video != nullptr ? double{video->dDuration} : 0; // copies: the records are packed
     if (plan.sound || plan.soundBeside)
         length = std::max(length, double{audio->dDuration});
     return fileLength > 0 && (length <= 0 || fileLength < length) ? fileLength : length;
