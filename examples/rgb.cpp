@@ -9,6 +9,9 @@
 
 struct Canvas {
     static constexpr int kWidth = 321, kHeight = 241, kRate = 25, kPictures = 50; // odd sizes do too
+    // The routines go by BT.601, and players take BT.709 from 720 lines on where a file tells nothing: larger
+    // pictures need nColorMatrix 6 in the media writer's options (movieconv/WriterStatus.h).
+    static_assert(kHeight < 720);
     static constexpr int kChromaWidth = (kWidth + 1) / 2, kChromaHeight = (kHeight + 1) / 2;
     std::vector<unsigned char> pixels =
         std::vector<unsigned char>(4 * kWidth * kHeight); // blue, green, red, -

@@ -39,8 +39,8 @@ def _program() -> str:
 
 class Conversion:
     """A running conversion. Iterating over it gives FileProgress until it is done and raises ConversionError when
-    it fails; `wait()` does that without the news. Leaving a `with` block early stops it; where it has failed before and
-    nobody has read its news, that raises ConversionError, too."""
+    it fails; `wait()` does that without the news. Leaving a `with` block early stops it, and `files` tells what was made;
+    where it has failed, that raises ConversionError, too."""
 
     def __init__(self, arguments: List[str]) -> None:
         self._messages = tempfile.TemporaryFile()
@@ -50,28 +50,29 @@ class Conversion:
         self._paused = False
         self._stopped = False
         self._concluded = False
+        self._errors: List[str] = []  # what the program has told of them
         self._error: Optional[str] = None
         self.warnings: List[str] = []  # what was put right or is worth knowing
         self.files: List[str] = []  # complete, on the disk, under their names
 
     def __iter__(self) -> Iterator[FileProgress]:
-        errors: List[str] = []
         assert self._process.stdout is not None
         if self._concluded:
             self._raise_error()
             return
         for line in self._process.stdout:
             event = json.loads(line)
-            if event["event"] == "progress":
+            kind = event.get("event")
+            if kind == "progress":
                 yield FileProgress(event["phase"], event["percent"] or 0.0, event["position_s"] or 0.0,
                                    event["speed"], event["left_s"], event["bytes"] or 0)
-            elif event["event"] == "clip_closed":
+            elif kind == "clip_closed":
                 self.files.append(event["path"])
-            elif event["event"] in ("warning", "error"):
-                (self.warnings if event["event"] == "warning" else errors).append(event["text"])
-        self._conclude(errors)
+            elif kind in ("warning", "error"):
+                (self.warnings if kind == "warning" else self._errors).append(event["text"])
+        self._conclude()
 
-    def _conclude(self, errors: List[str]) -> None:
+    def _conclude(self) -> None:
         code = self._process.wait()
         self._messages.seek(0)
         messages = self._messages.read().decode("utf-8", "replace").strip()
@@ -79,7 +80,7 @@ class Conversion:
         # Before the program can take the signal, it ends by it.
         if code == 0 or (self._stopped and code in (6, -signal.SIGTERM)):
             return
-        text = " ".join(errors) or messages or f"The program movieconv ended with {code}."
+        text = " ".join(self._errors) or messages or f"The program movieconv ended with {code}."
         self._error = text
         self._raise_error()
 
@@ -131,14 +132,11 @@ class Conversion:
             return
         if self._process.poll() is None:
             self.stop()
-        elif kind is None:
-            self.wait()  # it has ended by itself: whether well, nobody has asked
-            return
-        assert self._process.stdout is not None
-        for _ in self._process.stdout:  # it waits for a reader before it ends
-            pass
-        self._process.wait()
-        self._close()
+        try:
+            self.wait()  # the program waits for a reader before it ends; how it ended, nobody has asked
+        except ConversionError:
+            if kind is None:
+                raise
 
 
 def convert(source: "str | os.PathLike[str]", output: "str | os.PathLike[str]", *options: str) -> Conversion:

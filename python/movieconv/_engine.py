@@ -2,11 +2,13 @@
 
 from __future__ import annotations
 
+import contextlib
 import ctypes as c
 import enum
+import math
 import os
 from dataclasses import dataclass
-from typing import Any, Callable, Iterable, Optional, Tuple
+from typing import Any, Callable, Iterable, Iterator, Optional, Tuple
 
 from . import _library as lib
 from ._buffers import Pointer, numpy, view
@@ -147,6 +149,8 @@ class _Pictures:
         if self._next is None:
             raise ValueError("There is no picture.")
         self.width, self.height = size or self._size_of(self._next)
+        if not (0 < self.width < 2**31 and 0 < self.height < 2**31):
+            raise ValueError(f"Pictures have a width and a height above 0, not {self.width} x {self.height}.")
         self.table = lib.VideoSource(
             c.sizeof(lib.VideoSource), None, lib.GetVideoFormat(failure(self._describe, 0)), lib.Seek(),
             lib.GetPicture(failure(self._give, -1)), lib.Release())
@@ -276,6 +280,21 @@ class _Sound:
         return data
 
 
+@contextlib.contextmanager
+def _writer_set() -> Iterator[int]:
+    """The number of a set of the writer's options. Files tell that their matrix is that of BT.601, as otherwise players
+    take BT.709's from 720 lines on."""
+    bt601 = 6
+    engine = _engine()
+    number = engine.MWRegisterOptions(c.byref(lib.WriterOptions(nSize=c.sizeof(lib.WriterOptions), nColorMatrix=bt601)))
+    if number == 0:
+        raise MemoryError
+    try:
+        yield number
+    finally:
+        engine.MWUnregisterOptions(number)
+
+
 def _parameters(path: str, options: dict[str, Any]) -> lib.EncodeParam:
     param = lib.EncodeParam()
     if _engine().MCEncodeParamForFile(path, c.byref(param)) == 0:
@@ -332,10 +351,11 @@ def write(
 ) -> Result:
     """Writes a movie and returns when the file is complete, on the disk, under its name.
 
-    pictures: RGB or RGBA as uint8 arrays (height, width, 3 or 4), tuples (y, u, v) of 4:2:0 planes, or bytes of RGB
-        with size=(width, height); `rate` a second. All of one size is usual; others are fitted into the first one's.
+    pictures: RGB or RGBA as uint8 arrays (height, width, 3 or 4), tuples (y, u, v) of 4:2:0 planes by BT.601, or bytes
+        of RGB with size=(width, height); `rate` a second. All of one size is usual; others are fitted into the first one's.
     sound: blocks of any length of `channels` interleaved channels: int16 or float (-1 to 1) arrays (n,) or
         (n, channels), or bytes of 16-bit little-endian samples.
+    rate, sample_rate, channels: above 0.
     duration: the length in seconds if it is known, for `progress`.
     output_size, codecs, file_format (four-character codes as in docs/decoders.md), bitrates (bits a second): what
         the extension of `path` chooses, and the pictures' size, unless given.
@@ -347,6 +367,10 @@ def write(
     name = lib.wide_path(path)
     if pictures is None and sound is None:
         raise ValueError("A movie has pictures or sound.")
+    if pictures is not None and not (math.isfinite(rate) and rate > 0):
+        raise ValueError(f"The rate of pictures is above 0, not {rate}.")
+    if sound is not None and not (0 < sample_rate < 2**31 and 0 < channels < 2**31):
+        raise ValueError(f"Sound has a sample rate and channels above 0, not {sample_rate} and {channels}.")
     engine = _engine()
     failure = _Failure()
     param = _parameters(name, dict(video_codec=video_codec, audio_codec=audio_codec, file_format=file_format,
@@ -368,13 +392,14 @@ def write(
     if not handle:
         raise failure.error or ConversionError("The converter could not be created; the log tells why.")
     try:
-        engine.MCEnableEvents(handle, 0)
-        engine.MCEnableStopOnFailure(handle, 1)
-        engine.MCSetEncodeParam(handle, c.byref(param))
-        engine.MCSetOutputFile(handle, name)
-        engine.MCStart(handle, 0.0, 0.0, None, callback, None)
-        _await(handle)
-        result = _result_of(handle)
+        with _writer_set() as param.nReserved[0]:
+            engine.MCEnableEvents(handle, 0)
+            engine.MCEnableStopOnFailure(handle, 1)
+            engine.MCSetEncodeParam(handle, c.byref(param))
+            engine.MCSetOutputFile(handle, name)
+            engine.MCStart(handle, 0.0, 0.0, None, callback, None)
+            _await(handle)
+            result = _result_of(handle)
     finally:
         engine.MCDestroy(handle)
         for source in filter(None, (video, audio)):

@@ -48,6 +48,16 @@ class EncodeParam(c.Structure):
                 ("bNoVideo", c.c_int32), ("bNoAudio", c.c_int32), ("fccFileFormat", c.c_uint32)]
 
 
+class WriterOptions(c.Structure):
+    """As in its first version, which the library fills up."""
+
+    _fields_ = [("nSize", c.c_uint32), ("nSampleAspectNum", c.c_int32), ("nSampleAspectDen", c.c_int32),
+                ("bFullRange", c.c_int32), ("nColorPrimaries", c.c_int32), ("nColorTransfer", c.c_int32),
+                ("nColorMatrix", c.c_int32), ("nEncoderThreads", c.c_int32), ("bBitExact", c.c_int32),
+                ("bKeepExisting", c.c_int32), ("bRemovePartial", c.c_int32), ("pfnListener", c.c_void_p),
+                ("pfnFullDisk", c.c_void_p), ("pContext", c.c_void_p)]
+
+
 class TimeData(c.Structure):
     _fields_ = [("nHours", c.c_uint32), ("nMinutes", c.c_uint32), ("nSeconds", c.c_uint32),
                 ("nMilliseconds", c.c_uint32)]
@@ -106,6 +116,8 @@ _FUNCTIONS = {
     "MCAbort": (c.c_int, [_HANDLE]),
     "MCWait": (c.c_int, [_HANDLE, c.c_uint]),
     "MCGetResult": (c.c_int, [_HANDLE, c.POINTER(MCResult)]),
+    "MWRegisterOptions": (c.c_uint32, [c.POINTER(WriterOptions)]),  # of the media writer, which the library loads
+    "MWUnregisterOptions": (c.c_int, [c.c_uint32]),
 }
 
 

@@ -82,6 +82,26 @@ def test_errors_are_exceptions_with_a_sentence(tmp_path):
     assert list(tmp_path.iterdir()) == []
 
 
+@pytest.mark.parametrize("wrong", [
+    dict(rate=0), dict(rate=-1), dict(rate=float("nan")), dict(rate=float("inf")), dict(sample_rate=0),
+    dict(channels=0), dict(size=(0, 48)), dict(sample_rate=2**32)])
+def test_what_makes_no_movie_is_told_by_its_name(tmp_path, wrong):
+    with pytest.raises(ValueError, match="above 0"):
+        movieconv.write(tmp_path / "out.mp4", **{"pictures": pictures(2), "sound": tone(0.1), **wrong})
+    assert list(tmp_path.iterdir()) == []
+
+
+@pytest.mark.parametrize("size", [(320, 240), (1280, 720)])
+def test_colours_are_what_the_file_says_in_every_size(tmp_path, size):
+    red = numpy.full((size[1], size[0], 3), (255, 0, 0), numpy.uint8)
+    movieconv.write(tmp_path / "out.mp4", [red] * 3, video_codec="H264", video_bitrate=4_000_000)
+    space = subprocess.run(["ffprobe", "-v", "error", "-show_entries", "stream=color_space", "-of", "csv=p=0",
+                            tmp_path / "out.mp4"], capture_output=True, text=True, check=True).stdout.strip()
+    seen = subprocess.run(["ffmpeg", "-v", "error", "-i", tmp_path / "out.mp4", "-frames:v", "1", "-f", "rawvideo",
+                           "-pix_fmt", "rgb24", "-"], capture_output=True, check=True).stdout[:3]
+    assert space == "smpte170m" and seen[0] > 248 and max(seen[1:]) < 6
+
+
 def test_what_an_iterable_raises_comes_out_and_the_file_is_closed(tmp_path):
     def failing():
         yield from pictures(10)
@@ -167,6 +187,41 @@ def test_a_failure_that_nobody_read_is_raised_at_the_end_of_with(tmp_path):
             conversion._process.wait()
     with pytest.raises(ConversionError, match="in.mp5"):
         conversion.wait()
+
+
+def test_leaving_a_conversion_early_tells_its_file(tmp_path):
+    movieconv.write(tmp_path / "in.mp4", pictures(3000))
+    with movieconv.convert(tmp_path / "in.mp4", tmp_path / "out.mkv", "--size", "1280x720") as conversion:
+        for progress in conversion:
+            if progress.percent > 0:
+                break
+    assert conversion.files == [str(tmp_path / "out.mkv")] and (tmp_path / "out.mkv").exists()
+
+
+@pytest.mark.parametrize("code", [0, 4, 6])
+def test_leaving_a_conversion_early_raises_where_it_fails(tmp_path, monkeypatch, code):
+    failing = tmp_path / "movieconv"
+    failing.write_text("#!/bin/sh\n"
+                       "trap 'echo \"{\\\"event\\\": \\\"error\\\", \\\"text\\\": \\\"no folder\\\"}\"; "
+                       f"exit {code}' TERM\n"
+                       "echo '{\"event\": \"progress\", \"phase\": \"converting\", \"percent\": 1, "
+                       "\"position_s\": 1, \"speed\": 1, \"left_s\": 1, \"bytes\": 1}'\n"
+                       "while :; do sleep 0.05; done\n")
+    failing.chmod(0o755)
+    monkeypatch.setenv("MOVIECONV_PROGRAM", str(failing))
+    def leave():
+        with movieconv.convert("in.mkv", "out.mkv") as conversion:
+            for _ in conversion:
+                break
+    if code == 4:
+        with pytest.raises(ConversionError, match="no folder"):
+            leave()
+    else:
+        leave()
+    with pytest.raises(KeyError):  # what the block raises itself comes first
+        with movieconv.convert("in.mkv", "out.mkv") as conversion:
+            next(iter(conversion))
+            raise KeyError
 
 
 def test_write_keeps_nothing_of_what_it_was_given(tmp_path):
