@@ -127,14 +127,6 @@ PictureSettings MakePictureSettings(const EncodeParam& param, const VideoFormat&
     return settings;
 }
 
-/// How colours are turned to RGB: as told, or by the usual guess.
-int RgbMatrix(const PictureSettings& settings) {
-    constexpr int kLeastHdHeight = 720;
-    if (settings.matrix != AVCOL_SPC_UNSPECIFIED)
-        return settings.matrix;
-    return settings.height >= kLeastHdHeight ? SWS_CS_ITU709 : SWS_CS_ITU601;
-}
-
 /// What is not stated is taken for it, too.
 bool IsBt601(AVColorSpace matrix) {
     return matrix == AVCOL_SPC_UNSPECIFIED || matrix == AVCOL_SPC_BT470BG || matrix == AVCOL_SPC_SMPTE170M;
@@ -169,7 +161,7 @@ void SetColours(PicturePlan& plan, const Carriage& carriage, const WriterOptions
     plan.sourceFullRange = options.bFullRange != 0;
     plan.picture.fullRange = plan.sourceFullRange || plan.codec->format == AV_PIX_FMT_YUVJ420P;
     plan.settings.fullRange = plan.picture.fullRange;
-    plan.picture.matrix = plan.picture.sourceMatrix = RgbMatrix(plan.settings);
+    plan.picture.matrix = plan.picture.sourceMatrix = plan.settings.matrix;
     if ((plan.codec->isBt601 || carriage.isBt601) && !IsBt601(plan.settings.matrix)) {
         plan.picture.matrix = SWS_CS_ITU601;
         plan.settings.matrix = AVCOL_SPC_BT470BG;

@@ -28,9 +28,7 @@ void CopyPlane(std::vector<uint8_t>& target, const uint8_t* plane, int pitch, st
 void PictureTap::Expect(const PictureStreamInfo& source, bool keepsHdr) {
     if (keepsHdr)
         filter_.emplace(source, SourceChoice{.deinterlace = Deinterlace::kNone});
-    int matrix = HandedOutMatrix(source, false); // where HDR is kept, the filter takes it away
-    if (matrix == kMatrixUnstated)
-        matrix = UsualMatrix(source);
+    const int matrix = HandedOutMatrix(source, false); // where HDR is kept, the filter takes it away
     matrix_ = matrix == AVCOL_SPC_SMPTE170M ? SWS_CS_ITU601 : matrix; // the same one
 }
 

@@ -17,13 +17,17 @@ int UsualMatrix(const PictureStreamInfo& pictures) {
     constexpr int kBt2020 = 9;
     if (IsHdr(pictures))
         return kBt2020;
-    return pictures.height >= kLeastHdHeight ? kMatrixBt709 : kBt601;
+    const bool onSide = pictures.quarterTurns % 2 != 0;
+    const int lines = onSide ? pictures.width + pictures.crop.left + pictures.crop.right
+                             : pictures.height + pictures.crop.top + pictures.crop.bottom;
+    return lines >= kLeastHdHeight ? kMatrixBt709 : kBt601;
 }
 
 int HandedOutMatrix(const PictureStreamInfo& pictures, bool keepsHdr) {
     if (IsHdr(pictures) && !keepsHdr)
         return kMatrixBt709;
-    return pictures.colorMatrix == kMatrixRgb ? UsualMatrix(pictures) : pictures.colorMatrix;
+    const bool isStated = pictures.colorMatrix != kMatrixRgb && pictures.colorMatrix != kMatrixUnstated;
+    return isStated ? pictures.colorMatrix : UsualMatrix(pictures);
 }
 
 } // namespace movieconv

@@ -15,8 +15,6 @@ OverlayColours ColoursFor(const PictureStreamInfo& pictures, bool keepsHdr) {
     constexpr double kWhiteOfPerceptualQuantizer = 0.58;
     constexpr double kWhiteOfHybridLogGamma = 0.75;
     OverlayColours colours{HandedOutMatrix(pictures, keepsHdr), 1};
-    if (colours.matrix == kMatrixUnstated)
-        colours.matrix = UsualMatrix(pictures);
     if (IsHdr(pictures) && keepsHdr)
         colours.white = pictures.colorTransfer == kPerceptualQuantizer ? kWhiteOfPerceptualQuantizer
                                                                        : kWhiteOfHybridLogGamma;

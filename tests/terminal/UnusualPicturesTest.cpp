@@ -214,6 +214,42 @@ TEST(UnusualPictures, RgbIsShownInItsColoursByWhatTheOutputSays) {
     }
 }
 
+/// From 720 lines on players take BT.709, also where an output of another size or codec has another usual
+/// one.
+TEST(UnusualPictures, ColoursOfAnHdMovieThatTellsNothingAreKeptInEveryOutput) {
+    const std::string source =
+        Make("untold-hd.mp4",
+             Words("-f lavfi -i color=red:s=1280x720:r=5:d=0.4 -vf "
+                   "scale=out_color_matrix=bt709,format=yuv420p -c:v libx264 -qp 1 -color_primaries "
+                   "unknown -color_trc unknown -colorspace unknown"));
+    ASSERT_EQ(Ffprobe(source, Words("-show_entries stream=color_space -of csv=p=0")), "unknown\n");
+    const struct {
+        const char* output;
+        Args options;
+    } cases[] = {
+        {"o.gif", {}},
+        {"o.gif", {"--size", "320x180"}},
+        {"o.avi", {"--video-codec", "MJPG"}},
+        {"o.avi", {"--video-codec", "XVID"}},
+        {"o.mp4", {"--size", "640x360"}},
+        {"o.mp4", {"--crop", "100:100:0:0"}},
+        {"o.mkv", {"--size", "640x360", "--jobs", "2", "--pieces", "1"}},
+        {"o.webm", {"--video-codec", "VP80"}},
+    };
+    for (const auto& test : cases) {
+        SCOPED_TRACE(test.output + std::to_string(&test - cases));
+        const Folder folder;
+        const std::string made = folder / test.output;
+        const Result result = Call(Join(Args{"--preset", "standard", source, made}, test.options));
+        ASSERT_EQ(result.code, 0) << result.err;
+        const std::string picture = FfmpegReads(made, Words("-frames:v 1 -f rawvideo -pix_fmt rgb24"));
+        ASSERT_GT(picture.size(), 3U);
+        EXPECT_GT(static_cast<unsigned char>(picture[0]), 244);
+        EXPECT_LT(static_cast<unsigned char>(picture[1]), 12);
+        EXPECT_LT(static_cast<unsigned char>(picture[2]), 12);
+    }
+}
+
 TEST(UnusualPictures, WhatTheOutputCannotHoldIsTold) {
     const Args tones = Words("-f lavfi -i anullsrc=cl=7.1:r=192000:d=0.2 -c:a flac");
     const Args interlaced = Words("-vf setfield=tff -c:v libx264 -flags +ilme+ildct");
