@@ -42,6 +42,10 @@ Sentence WhyItEndedEarly(const Movie& movie, const Request& request, double reac
         return Say("it is cut off");
     const std::string end = FormatTime(missing->reached, true);
     const std::string announced = FormatTime(missing->announced, true);
+    if (missing->undecodable == StreamKind::kPictures)
+        return Say("none of its pictures from {} to its end at {} could be decoded", end, announced);
+    if (missing->undecodable)
+        return Say("none of its sound from {} to its end at {} could be decoded", end, announced);
     return missing->cutOff ? Say("it is cut off: it ends at {} although it announces {}", end, announced)
                            : Say("it ends at {} although it announces {}", end, announced);
 }

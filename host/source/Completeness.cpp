@@ -99,7 +99,7 @@ std::optional<Shortfall> Compare(std::optional<double> announced, std::optional<
     const double missing = *announced - *reached;
     if (missing <= kToleratedSeconds || missing <= kToleratedShare * *announced)
         return std::nullopt;
-    return Shortfall{false, *announced, *reached};
+    return Shortfall{false, {}, *announced, *reached};
 }
 
 } // namespace

@@ -10,6 +10,8 @@
 
 namespace movieconv {
 
+enum class StreamKind;
+
 /// What the container announces. Lengths that were measured or reckoned are no promise.
 struct Promise {
     bool cutOff = false;            ///< The file's structure or index reaches beyond its last byte.
@@ -28,6 +30,8 @@ struct Reached {
 /// What is missing at a source's end.
 struct Shortfall {
     bool cutOff = false;
+    /// Of that kind, which is there, but nothing of its last part could be decoded.
+    std::optional<StreamKind> undecodable;
     double announced = 0; ///< Seconds of the stream that ended early; 0 when nothing but the cut tells.
     double reached = 0;
 };

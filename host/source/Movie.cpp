@@ -81,7 +81,9 @@ std::optional<Shortfall> Movie::Missing() const {
     std::optional<Shortfall> found = FindShortfall(Info().promise, ends);
     if (found && !found->cutOff)
         found = FindShortfall(ShownByStructure(), ends);
-    return found ? found : LateShortfall(ends);
+    if (!found)
+        found = LateShortfall(ends);
+    return found ? found : UndecodedShortfall();
 }
 
 /// What the source promises, of which the length that a last picture is said to stay is not to be found in
@@ -113,6 +115,25 @@ std::optional<Shortfall> Movie::LateShortfall(const Reached& ends) const {
         (left.kind == StreamKind::kPictures ? promise.pictures : promise.sound) = ToSeconds(left.end);
         found = found ? found : FindShortfall(promise, ends);
     }
+    return found;
+}
+
+/// What was read of a damaged stream but gave nothing up to its end. What is copied is as its source.
+std::optional<Shortfall> Movie::UndecodedShortfall() const {
+    const auto compare = [&](const auto& decoder, int stream) {
+        std::optional<Shortfall> found;
+        if (decoder->RanDry() && decoder->Damaged() > 0)
+            found = FindShortfall({false, ToSeconds(demuxer_.EndOf(stream).value_or(0)), {}, {}},
+                                  {ToSeconds(decoder->DecodedTo()), {}});
+        if (found)
+            found->undecodable = Info().streams[static_cast<std::size_t>(stream)].kind;
+        return found;
+    };
+    std::optional<Shortfall> found;
+    if (pictures_)
+        found = compare(pictures_, Info().pictures->index);
+    if (!found && sound_ && !beside_.Copies(Info().sound->index))
+        found = compare(sound_, Info().sound->index);
     return found;
 }
 

@@ -84,6 +84,7 @@ public:
 private:
     Promise ShownByStructure() const;
     std::optional<Shortfall> LateShortfall(const Reached& ends) const;
+    std::optional<Shortfall> UndecodedShortfall() const;
 
     const SourceChoice choice_;
     Source source_;

@@ -118,7 +118,7 @@ void PictureDecoder::Run() {
     failures_.Attempt([this] {
         DecodeAll();
         if (const auto last = stamps_.Finish(lastStay_.Told(reader_, timeBase_)); last && held_)
-            Deliver(*last);
+            Deliver(*last, true);
     });
     ranDry_ = !refused_;
     repaired_ = stamps_.Repaired();
@@ -166,7 +166,7 @@ bool PictureDecoder::Accept(AVFrame& frame) {
 /// Keeps the picture until its stamp is settled, and hands on the one before it.
 bool PictureDecoder::Hold(AVFrame& picture, std::optional<int64_t> stamp) {
     const auto previous = stamps_.Push(stamp);
-    if (previous && !Deliver(*previous)) {
+    if (previous && !Deliver(*previous, false)) {
         held_.reset();
         return false;
     }
@@ -177,8 +177,9 @@ bool PictureDecoder::Hold(AVFrame& picture, std::optional<int64_t> stamp) {
 
 /// Hands the held picture on, unless it is over before the conversion begins. False when that ends before it,
 /// or nobody takes it any more.
-bool PictureDecoder::Deliver(StampRepair::Stamp stamp) {
-    const PictureRange::Place place = range_.Fit(stamp);
+bool PictureDecoder::Deliver(StampRepair::Stamp stamp, bool isLast) {
+    decodedTo_ = stamp.time + stamp.duration;
+    const PictureRange::Place place = range_.Fit(stamp, isLast);
     refused_ = place == PictureRange::Place::kBehind;
     if (place != PictureRange::Place::kWithin)
         return !refused_;

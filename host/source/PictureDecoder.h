@@ -63,6 +63,9 @@ public:
     /// Whether the source's last picture has been decoded and handed on. Any thread.
     bool RanDry() const { return ranDry_; }
 
+    /// Where the last picture that could be decoded ends, in media time; 0 without one. Any thread.
+    int64_t DecodedTo() const { return decodedTo_; }
+
     /// The picture handed out last, null without one. Once the conversion has ended.
     const VideoImage* Last() const { return current_.frame ? &image_ : nullptr; }
 
@@ -76,7 +79,7 @@ private:
     void DecodeAll();
     bool Accept(AVFrame& frame);
     bool Hold(AVFrame& picture, std::optional<int64_t> stamp);
-    bool Deliver(StampRepair::Stamp stamp);
+    bool Deliver(StampRepair::Stamp stamp, bool isLast);
     bool UseMoreThreads(const std::vector<av::Packet>& known);
     bool Advance();
 
@@ -108,6 +111,7 @@ private:
     std::atomic<int64_t> damaged_{0};
     std::atomic<int64_t> repaired_{0};
     std::atomic<bool> ranDry_{false};
+    std::atomic<int64_t> decodedTo_{0};
     std::atomic<bool> deinterlaced_{false};
     std::atomic<bool> leftInterlaced_{false};
     PictureNotes notes_;

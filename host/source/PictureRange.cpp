@@ -7,13 +7,17 @@
 
 namespace movieconv {
 
-PictureRange::Place PictureRange::Fit(StampRepair::Stamp& stamp) const {
+PictureRange::Place PictureRange::Fit(StampRepair::Stamp& stamp, bool isLast) const {
     if (end_ && stamp.time >= *end_)
         return Place::kBehind;
     if (end_)
         stamp.duration = std::min(stamp.duration, *end_ - stamp.time);
-    if (begin_ && stamp.time + stamp.duration <= *begin_)
-        return Place::kBefore;
+    if (begin_ && stamp.time + stamp.duration <= *begin_) {
+        if (!isLast || !first_)
+            return Place::kBefore;
+        stamp.time = *begin_;
+        return Place::kWithin;
+    }
     const int64_t begin = begin_.value_or(0);
     if (first_ && (begin_ || stamp.time > begin)) {
         stamp.duration += stamp.time - begin;

@@ -23,8 +23,9 @@ public:
     /// The last picture is the one before `end`, where it ends, too.
     void EndAt(int64_t end) { end_ = end; }
 
-    /// Where a picture lies; its stamp is fitted in.
-    Place Fit(StampRepair::Stamp& stamp) const;
+    /// Where a picture lies; its stamp is fitted in. The source's last one is still shown at a `begin` behind
+    /// it.
+    Place Fit(StampRepair::Stamp& stamp, bool isLast) const;
 
     /// One was handed out.
     void Gave() { first_ = false; }

@@ -51,7 +51,7 @@ bool PictureStamps::Advance() {
         if (!stamp)
             return false;
         rest_ = *stamp;
-        const PictureRange::Place place = range_.Fit(rest_);
+        const PictureRange::Place place = range_.Fit(rest_, settledAll_);
         if (place != PictureRange::Place::kWithin)
             rest_ = {};
         if (place == PictureRange::Place::kBehind)

@@ -31,7 +31,7 @@ SoundDecoder::SoundDecoder(const Source& source, Demuxer& demuxer, Failures& fai
       stream_(source.SoundStream()->index),
       besidePictures_(source.Info().pictures.has_value()),
       decoder_(source.Reader(), *source.SoundStream(), *source.Info().sound,
-               {[this](PcmDecoder::Chunk chunk) { return Push(std::move(chunk)); },
+               {[this](PcmDecoder::Chunk chunk) { return PushSound(std::move(chunk)); },
                 [this](int64_t samples) { return PushSilence(samples); }}),
       queue_(1 << 12,
              static_cast<std::size_t>(source.Info().sound->sampleRate) *
@@ -123,7 +123,7 @@ void SoundDecoder::DecodeAll() {
         damaged_ = decoder_.Damaged();
     }
     // Begun behind the sound's end: a block to say where, or the silence for the pictures would begin at 0.
-    if (begin_ > 0 && besidePictures_ && !pushed_)
+    if (begin_ > 0 && besidePictures_ && samplesPushed_ == 0)
         Push(PcmDecoder::Chunk(static_cast<std::size_t>(blockBytes_)));
 }
 
@@ -137,9 +137,15 @@ bool SoundDecoder::PushSilence(int64_t samples) {
     return true;
 }
 
+bool SoundDecoder::PushSound(PcmDecoder::Chunk chunk) {
+    const bool isTaken = Push(std::move(chunk));
+    decodedTo_ = begin_ + TimeOfSamples(samplesPushed_, info_.format.nSampleRate);
+    return isTaken;
+}
+
 bool SoundDecoder::Push(PcmDecoder::Chunk chunk) {
     const std::size_t bytes = chunk.size();
-    pushed_ = true;
+    samplesPushed_ += static_cast<int64_t>(bytes) / frameBytes_;
     refused_ = !queue_.Push(std::move(chunk), bytes);
     return !refused_;
 }

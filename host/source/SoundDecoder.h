@@ -45,11 +45,15 @@ public:
     /// Whether the source's last sound has been decoded and handed on. Any thread.
     bool RanDry() const { return ranDry_; }
 
+    /// Where the last sound that could be decoded ends, in media time; 0 without any. Any thread.
+    int64_t DecodedTo() const { return decodedTo_; }
+
 private:
     int64_t MostBytes() const;
     void Run();
     void DecodeAll();
     bool PushSilence(int64_t samples);
+    bool PushSound(PcmDecoder::Chunk chunk);
     bool Push(PcmDecoder::Chunk chunk);
 
     Demuxer& demuxer_;
@@ -64,8 +68,8 @@ private:
 
     // The decoding thread's.
     PcmDecoder decoder_;
-    bool pushed_ = false;  // some sound
-    bool refused_ = false; // nobody takes sound any more
+    int64_t samplesPushed_ = 0; // silence included
+    bool refused_ = false;      // nobody takes sound any more
 
     // Between the threads.
     BoundedQueue<PcmDecoder::Chunk> queue_;
@@ -73,6 +77,7 @@ private:
     std::atomic<int> corrections_{0};
     std::atomic<int> channels_{0};
     std::atomic<bool> ranDry_{false};
+    std::atomic<int64_t> decodedTo_{0};
     std::atomic<int64_t> samplesDelivered_{0};
     std::thread thread_;
 

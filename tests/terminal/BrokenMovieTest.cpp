@@ -199,4 +199,42 @@ TEST(BrokenMovie, TracksThatChangeOnTheWay) {
         }
 }
 
+/// Makes the data of a stream's packets from that time on unreadable.
+void Wreck(const std::string& path, const std::string& stream, double from) {
+    std::string bytes = ReadFile(path);
+    const Json packets = Json::parse(test_movies::Ffprobe(
+        path, Words("-select_streams " + stream + " -show_entries packet=pts_time,pos,size -of json")));
+    for (const Json& packet : packets["packets"]) {
+        const auto value = [&](const char* key) { return std::stod(packet[key].get<std::string>()); };
+        const auto size = static_cast<std::size_t>(value("size"));
+        if (value("pts_time") >= from)
+            bytes.replace(static_cast<std::size_t>(value("pos")), size, size, '\xFF');
+    }
+    WriteFile(path, bytes);
+}
+
+/// Everything is read, but it gives no pictures, or no sound, up to its end.
+TEST(BrokenMovie, WhatCannotBeDecodedToItsEndIsNoSuccess) {
+    const struct {
+        const char* stream;
+        double from;
+        const char* told; // nothing: what is missing is short
+    } cases[] = {
+        {"v", -1, "none of its pictures from 0:00:00.000 to its end at 0:00:04.000 could be decoded"},
+        {"v", 2, "none of its pictures from 0:00:02.000 to its end at 0:00:04.000 could be decoded"},
+        {"v", 3.5, nullptr},
+        {"a", -1, "none of its sound from 0:00:00.000 to its end at 0:00:04.000 could be decoded"},
+    };
+    for (const auto& test : cases) {
+        SCOPED_TRACE(std::string(test.stream) + std::to_string(test.from));
+        const Folder folder;
+        Ffmpeg(Join(Lavfi("testsrc=s=64x48:r=10:d=4", "sine=d=4:r=48000"),
+                    Words("-c:v libx264 -pix_fmt yuv420p -g 10 -bf 0 -c:a aac"), Args{folder / "in.mp4"}));
+        Wreck(folder / "in.mp4", test.stream, test.from);
+        const Result made = Call({folder / "in.mp4", folder / "out.mkv", "-q"});
+        EXPECT_EQ(made.code, test.told ? 3 : 0);
+        EXPECT_NE(made.err.find(test.told ? test.told : ""), std::string::npos) << made.err;
+    }
+}
+
 } // namespace

@@ -38,6 +38,16 @@ TEST(Times, OfARangeBehindTheSoundAreThoseOfItsPictures) {
     }
 }
 
+// The last one is what a player shows there.
+TEST(Times, OfARangeBehindThePicturesBeginWithTheLastOne) {
+    const std::string source =
+        Make("short-pictures.mp4", Join(CountedPictures(1), Beeps(3), NearLossless(), Args{"-c:a", "aac"}));
+    const Seen seen = Convert(source, {"--begin", "2"}, "mp4");
+    ASSERT_EQ(seen.pictures.size(), 1U);
+    EXPECT_NEAR(seen.pictures[0].luma, LumaOf(24), 1);
+    EXPECT_NEAR(static_cast<double>(seen.sound.size()) / 44100, 1, 0.08);
+}
+
 TEST(Times, OfAMovieThatWasCutByAnEditListAreTheSameInPieces) {
     for (const char* codec : {"libx264", "mjpeg"}) {
         SCOPED_TRACE(codec);

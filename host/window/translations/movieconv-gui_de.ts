@@ -1233,6 +1233,14 @@
         <source>to keep below {}:</source>
         <translation>um unter {} zu bleiben:</translation>
     </message>
+    <message>
+        <source>none of its pictures from {} to its end at {} could be decoded</source>
+        <translation>von seinen Bildern ließ sich von {} bis zum Ende bei {} keines dekodieren</translation>
+    </message>
+    <message>
+        <source>none of its sound from {} to its end at {} could be decoded</source>
+        <translation>von seinem Ton ließ sich von {} bis zum Ende bei {} nichts dekodieren</translation>
+    </message>
 </context>
 <context>
     <name>LogShare</name>
