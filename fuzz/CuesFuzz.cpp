@@ -75,7 +75,7 @@ void FuzzClips(FuzzedDataProvider& input, std::vector<av::Packet> packets) {
         }
         fileBegin = fileEnd;
     }
-    FUZZ_CHECK(failures.First().empty());
+    FUZZ_CHECK(failures.First().IsEmpty());
 }
 
 /// One text at a time: what is handed out follows each other without overlaps.
