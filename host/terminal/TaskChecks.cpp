@@ -34,12 +34,16 @@ const KnownTask* FindTask(const CLI::Option& option) {
         // What is converted, and to what, stands in the plan.
         {"--piece", {kPieces, kReports}, {"--overwrite", "--on-full"}},
         {"--join", {kPieces, kReports}, {"--overwrite", "--on-full"}},
-        {"--info", {kRange, kEncoding, kPictures, kCarried, kOutput, kReports}},
+        // What decides which streams would be converted; --overwrite gives leave to append to the log.
+        {"--info",
+         {kReports},
+         {"--allow-playlists", "--no-video", "--no-audio", "--crop", "--audio-tracks", "--subtitles",
+          "--overwrite"}},
         {"--estimate", {kRange, kEncoding, kPictures, kSound, kMany, kPieces, kCarried, kOutput, kReports}},
-        {"--list-formats", {kOutput, kReports}},
-        {"--list-presets", {kOutput, kReports}},
-        {"--show-preset", {kOutput, kReports}},
-        {"--completion", {kOutput, kReports}},
+        {"--list-formats", {kReports}, {"--overwrite"}},
+        {"--list-presets", {kReports}, {"--overwrite"}},
+        {"--show-preset", {kReports}, {"--overwrite"}},
+        {"--completion", {kReports}, {"--overwrite"}},
     };
     const auto found = std::find_if(kTasks.begin(), kTasks.end(),
                                     [&](const KnownTask& task) { return option.get_name() == task.option; });
