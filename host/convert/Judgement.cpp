@@ -32,14 +32,14 @@ std::optional<Failure> WhyNothingIsThere(const Evidence& evidence) {
 } // namespace
 
 Sentence WhyItEndedEarly(const Movie& movie, const Request& request, double reached) {
-    const std::optional<Shortfall> missing = movie.Missing();
     const bool lengthReached = request.length && *request.length - reached <= kEarlyEnd;
-    if (!missing || lengthReached)
+    const std::optional<Shortfall> missing = lengthReached ? movie.Undecoded() : movie.Missing();
+    if (!missing)
         return {};
     if (HasShrunk(movie.Info()))
         return Say("the file was cut meanwhile");
     if (missing->announced <= 0)
-        return Say("it is cut off");
+        return missing->undecodable ? Say("none of its pictures could be decoded") : Say("it is cut off");
     const std::string end = FormatTime(missing->reached, true);
     const std::string announced = FormatTime(missing->announced, true);
     if (missing->undecodable == StreamKind::kPictures)

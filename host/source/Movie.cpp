@@ -5,6 +5,8 @@
 #include "host/source/PictureLosses.h"
 #include "host/source/SourceError.h"
 
+#include <algorithm>
+#include <limits>
 #include <utility>
 
 namespace movieconv {
@@ -48,6 +50,7 @@ Movie::Movie(const std::string& path, const SourceChoice& choice, std::shared_pt
 }
 
 void Movie::EndPicturesAt(double seconds) {
+    end_ = seconds;
     if (pictures_)
         pictures_->EndAt(seconds);
     if (stamps_)
@@ -83,7 +86,7 @@ std::optional<Shortfall> Movie::Missing() const {
         found = FindShortfall(ShownByStructure(), ends);
     if (!found)
         found = LateShortfall(ends);
-    return found ? found : UndecodedShortfall();
+    return found ? found : Undecoded();
 }
 
 /// What the source promises, of which the length that a last picture is said to stay is not to be found in
@@ -118,13 +121,16 @@ std::optional<Shortfall> Movie::LateShortfall(const Reached& ends) const {
     return found;
 }
 
-/// What was read of a damaged stream but gave nothing up to its end. What is copied is as its source.
-std::optional<Shortfall> Movie::UndecodedShortfall() const {
+/// What was read of a damaged stream but gave nothing up to its end, or to where it was to end. What is
+/// copied is as its source.
+std::optional<Shortfall> Movie::Undecoded() const {
+    const double wanted = end_.value_or(std::numeric_limits<double>::max());
     const auto compare = [&](const auto& decoder, int stream) {
         std::optional<Shortfall> found;
         if (decoder->RanDry() && decoder->Damaged() > 0)
-            found = FindShortfall({false, ToSeconds(demuxer_.EndOf(stream).value_or(0)), {}, {}},
-                                  {ToSeconds(decoder->DecodedTo()), {}});
+            found = FindShortfall(
+                {false, std::min(ToSeconds(demuxer_.EndOf(stream).value_or(0)), wanted), {}, {}},
+                {ToSeconds(decoder->DecodedTo()), {}});
         if (found)
             found->undecodable = Info().streams[static_cast<std::size_t>(stream)].kind;
         return found;
@@ -132,6 +138,8 @@ std::optional<Shortfall> Movie::UndecodedShortfall() const {
     std::optional<Shortfall> found;
     if (pictures_)
         found = compare(pictures_, Info().pictures->index);
+    if (!found && pictures_ && pictures_->RanDry() && LastPicture() == nullptr) // however short they are
+        found = Shortfall{false, StreamKind::kPictures, 0, 0};
     if (!found && sound_ && !beside_.Copies(Info().sound->index))
         found = compare(sound_, Info().sound->index);
     return found;

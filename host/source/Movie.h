@@ -66,6 +66,9 @@ public:
     /// it holds all. Once both streams ended.
     std::optional<Shortfall> Missing() const;
 
+    /// Of Missing what was read but could not be decoded, up to where it was to end.
+    std::optional<Shortfall> Undecoded() const;
+
     /// Pieces of picture data that were skipped. Once the pictures ended.
     int64_t DamagedPictures() const { return pictures_ ? pictures_->Damaged() : 0; }
 
@@ -84,7 +87,6 @@ public:
 private:
     Promise ShownByStructure() const;
     std::optional<Shortfall> LateShortfall(const Reached& ends) const;
-    std::optional<Shortfall> UndecodedShortfall() const;
 
     const SourceChoice choice_;
     Source source_;
@@ -95,6 +97,7 @@ private:
     std::unique_ptr<PictureStamps> stamps_; // instead of pictures_
     std::unique_ptr<SoundDecoder> sound_;
     BesideTracks beside_;
+    std::optional<double> end_; // of the pictures that are wanted, in seconds
 };
 
 } // namespace movieconv

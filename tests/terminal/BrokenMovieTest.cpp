@@ -219,10 +219,14 @@ TEST(BrokenMovie, WhatCannotBeDecodedToItsEndIsNoSuccess) {
         const char* stream;
         double from;
         const char* told; // nothing: what is missing is short
+        std::vector<std::string> further = {};
     } cases[] = {
         {"v", -1, "none of its pictures from 0:00:00.000 to its end at 0:00:04.000 could be decoded"},
         {"v", 2, "none of its pictures from 0:00:02.000 to its end at 0:00:04.000 could be decoded"},
         {"v", 3.5, nullptr},
+        {"v", 2, "none of its pictures from 0:00:02.000 to its end at 0:00:03.500", {"--length", "3.5"}},
+        {"v", 2, nullptr, {"--length", "2.5"}},
+        {"v", -1, "none of its pictures could be decoded", {"--length", "0.5"}},
         {"a", -1, "none of its sound from 0:00:00.000 to its end at 0:00:04.000 could be decoded"},
     };
     for (const auto& test : cases) {
@@ -231,7 +235,7 @@ TEST(BrokenMovie, WhatCannotBeDecodedToItsEndIsNoSuccess) {
         Ffmpeg(Join(Lavfi("testsrc=s=64x48:r=10:d=4", "sine=d=4:r=48000"),
                     Words("-c:v libx264 -pix_fmt yuv420p -g 10 -bf 0 -c:a aac"), Args{folder / "in.mp4"}));
         Wreck(folder / "in.mp4", test.stream, test.from);
-        const Result made = Call({folder / "in.mp4", folder / "out.mkv", "-q"});
+        const Result made = Call(Join(Args{folder / "in.mp4", folder / "out.mkv", "-q"}, test.further));
         EXPECT_EQ(made.code, test.told ? 3 : 0);
         EXPECT_NE(made.err.find(test.told ? test.told : ""), std::string::npos) << made.err;
     }

@@ -1238,6 +1238,14 @@
         <translation>von seinen Bildern ließ sich von {} bis zum Ende bei {} keines dekodieren</translation>
     </message>
     <message>
+        <source>none of its pictures could be decoded</source>
+        <translation>von seinen Bildern ließ sich keines dekodieren</translation>
+    </message>
+    <message>
+        <source>its pictures of full range got the usual one, which has fewer levels</source>
+        <translation>seine Bilder mit vollem Wertebereich bekamen den üblichen, der weniger Stufen hat</translation>
+    </message>
+    <message>
         <source>none of its sound from {} to its end at {} could be decoded</source>
         <translation>von seinem Ton ließ sich von {} bis zum Ende bei {} nichts dekodieren</translation>
     </message>
