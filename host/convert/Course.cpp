@@ -338,13 +338,16 @@ Verdict Course::Conclude() {
 void Course::ReportComplaints() {
     EncodeParam param{};
     MCGetEncodeParam(engine_.get(), &param);
-    std::vector<Sentence> complaints = TellSoundLoss(movie_.Info(), request_, param);
-    if (Sentence loss = TellRateLoss(request_, movie_.Info()); !loss.IsEmpty())
-        complaints.push_back(std::move(loss));
-    for (Sentence& complaint : movie_.Complaints())
-        complaints.push_back(std::move(complaint));
+    Complain(Warning::Kind::kLoss, TellSoundLoss(movie_.Info(), request_, param));
+    if (const Sentence loss = TellRateLoss(request_, movie_.Info()); !loss.IsEmpty())
+        Complain(Warning::Kind::kLoss, {loss});
+    Complain(Warning::Kind::kLoss, movie_.Losses());
+    Complain(Warning::Kind::kSource, movie_.Complaints());
+}
+
+void Course::Complain(Warning::Kind kind, const std::vector<Sentence>& complaints) {
     for (const Sentence& complaint : complaints)
-        observer_.Warned({Warning::Kind::kSource, Say("\"{}\": {}", request_.input, complaint)});
+        observer_.Warned({kind, Say("\"{}\": {}", request_.input, complaint)});
 }
 
 } // namespace movieconv

@@ -77,6 +77,7 @@ private:
     double Converted(double position) const;
     double Reached() const;
     void ReportComplaints();
+    void Complain(Warning::Kind kind, const std::vector<Sentence>& complaints);
 
     const Request request_; // with rates by the greatest size
     Movie& movie_;

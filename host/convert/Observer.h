@@ -75,6 +75,7 @@ struct Warning {
         kLeftover,     ///< Something of a run that broke off stays, for another one to go on with.
         kOlderClips,   ///< Clips of an earlier conversion stay beside the new ones.
         kSource,       ///< Something was wrong with the source and has been put right or skipped.
+        kLoss,         ///< The output has less of something than the source.
     };
     Kind kind;
     Sentence text;

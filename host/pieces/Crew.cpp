@@ -37,9 +37,7 @@ public:
     }
     void Opened(const OpenedFile& news) override { errand_->Opened(news); }
     void Closed(const ClosedFile& news) override { errand_->Closed(news); }
-    void Warned(const Warning& news) override {
-        crew_.outlet_.Warned({news.kind, news.text, errand_->Movie()});
-    }
+    void Warned(const Warning& news) override { errand_->Warned(news); }
     void LeftBehind(const NotCarried& news) override { errand_->LeftBehind(news); }
     void Ended(const Verdict& news) override {
         concluding_ = &news;

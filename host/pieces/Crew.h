@@ -27,9 +27,6 @@ public:
     /// is how it ends then.
     virtual void Conclude(Verdict& verdict) = 0;
 
-    /// Whose news it is where there are several movies; otherwise empty.
-    virtual std::string Movie() const { return {}; }
-
     /// How much of the whole work `latest` stands for, in seconds.
     virtual double Share(const Progress& latest) const { return latest.position; }
 

@@ -64,6 +64,7 @@ public:
 
     double Share(const Progress& latest) const override { return std::min(latest.position, length_); }
     void Closed(const ClosedFile& news) override { pictures_ = news.pictures; }
+    void Warned(const Warning& news) override { foreman_.TellOf(number_, news); }
     void LeftBehind(const NotCarried& news) override { foreman_.News().LeftBehind(news); }
     void Conclude(Verdict& verdict) override {
         const bool done = verdict.outcome == Outcome::kDone;
@@ -145,6 +146,19 @@ Verdict Foreman::Perform() {
     if (verdict_.outcome != Outcome::kDone && order_.request)
         TellWhatStays();
     return verdict_;
+}
+
+/// A piece's warning. What is lost is lost in all pieces and told once; how often the source's pictures were
+/// wrong was counted in that piece alone.
+void Foreman::TellOf(int number, Warning news) {
+    if (news.kind == Warning::Kind::kSource && !plan_.IsRest(number))
+        news.text = Sentence(fmt::format("in piece {}: {}", number, news.text.Text()));
+    if (news.kind == Warning::Kind::kSource || news.kind == Warning::Kind::kLoss) {
+        const std::lock_guard lock(mutex_);
+        if (!told_.insert(news.text.Text()).second)
+            return;
+    }
+    News().Warned(news);
 }
 
 void Foreman::TellWhatStays() {

@@ -58,14 +58,16 @@ private:
     Going FollowJoining(const Joining& latest);
     void JoinAll();
     void TellWhatStays();
+    void TellOf(int number, Warning news);
 
     const PieceOrder order_;
 
     // The foreman's thread's, and read by the pieces' threads while pieces are made.
     Plan plan_;
 
-    std::mutex mutex_;      // guards this
-    std::set<int> lacking_; // pieces that lack pictures, so far
+    std::mutex mutex_;           // guards these
+    std::set<int> lacking_;      // pieces that lack pictures, so far
+    std::set<std::string> told_; // of the source, by pieces
 
     // The foreman's thread's.
     std::optional<RunLock> lock_;

@@ -27,7 +27,6 @@ public:
           source_(std::move(source)),
           settings_(settings) {}
 
-    std::string Movie() const override { return input_; }
     void Opened(const OpenedFile& news) override {
         lock_.emplace(news.temporaryPath);
         journal_.NoteBegun(output_, source_, settings_, news.temporaryPath);
@@ -43,6 +42,7 @@ public:
         named.input = input_;
         news_.Closed(named);
     }
+    void Warned(const Warning& news) override { news_.Warned({news.kind, news.text, input_}); }
     void LeftBehind(const NotCarried& news) override {
         NotCarried named = news;
         named.input = input_;

@@ -145,11 +145,12 @@ std::optional<Shortfall> Movie::Undecoded() const {
     return found;
 }
 
+std::vector<Sentence> Movie::Losses() const {
+    return pictures_ ? PictureLosses(*Info().pictures, choice_, *pictures_) : std::vector<Sentence>();
+}
+
 std::vector<Sentence> Movie::Complaints() const {
     std::vector<Sentence> texts;
-    if (pictures_)
-        for (Sentence& loss : PictureLosses(*Info().pictures, choice_, *pictures_))
-            texts.push_back(std::move(loss));
     for (const LateStreams::Left& left : demuxer_.LeftOut())
         texts.push_back(TellLate(left));
     if (const int jumps = demuxer_.ClockJumps(); jumps > 0) {

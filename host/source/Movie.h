@@ -80,6 +80,9 @@ public:
     /// Times that the source's clock jumped and was put right. Once the pictures ended.
     int ClockJumps() const { return demuxer_.ClockJumps(); }
 
+    /// What its pictures do not have any more as they are handed out, a sentence each. Once they ended.
+    std::vector<Sentence> Losses() const;
+
     /// What was wrong with the movie and has been put right or skipped, a sentence each. Once both streams
     /// ended.
     std::vector<Sentence> Complaints() const;

@@ -439,6 +439,37 @@ TEST(Pieces, OfOutputsWithLongNamesAreRefusedBeforeAnythingIsRead) {
     }
 }
 
+TEST(Pieces, TellWhatAllOfThemLoseOnce) {
+    const Folder folder;
+    const std::string source = test_movies::Make(
+        "interlaced-pieces.mkv", test_movies::Join(test_movies::CountedPictures(4),
+                                                   Args{"-vf", "setfield=tff", "-c:v", "libx264", "-flags",
+                                                        "+ilme+ildct", "-g", "10", "-bf", "0"}));
+    const Result result =
+        Call({"--progress", "none", "--jobs", "2", "--pieces", "4", source, folder / "o.mp4"});
+    EXPECT_EQ(result.code, 0) << result.err;
+    const std::string told = "interlaced pictures were made progressive";
+    const std::size_t first = result.err.find(told);
+    ASSERT_NE(first, std::string::npos) << result.err;
+    EXPECT_EQ(result.err.find(told, first + 1), std::string::npos) << result.err;
+}
+
+TEST(Pieces, AreNamedWithWhatIsDamagedInThem) {
+    const Folder folder;
+    std::string bytes = ReadFile(test_movies::Make(
+        "damageable.mp4",
+        test_movies::Join(test_movies::CountedPictures(4), Args{"-c:v", "mpeg4", "-q:v", "2", "-g", "5"})));
+    const std::size_t size = bytes.size();
+    for (const std::size_t at : {size / 4, size * 3 / 4})
+        bytes.replace(at, size / 20, size / 20, '\xFF');
+    WriteFile(folder / "in.mp4", bytes);
+    const Result result =
+        Call({"--progress", "none", "--jobs", "2", "--pieces", "2", folder / "in.mp4", folder / "o.mp4"});
+    EXPECT_EQ(result.code, 0) << result.err;
+    for (const char* piece : {"in piece 0: \"", "in piece 1: \""})
+        EXPECT_TRUE(Has(result.err, piece)) << result.err;
+}
+
 TEST(Pieces, TellWhatIsLeftOnceTheyHaveStarted) {
     const Planned farm;
     ASSERT_EQ(Call({"-q", "--plan", farm.output + ".plan", "--pieces", "2", Source(), farm.output}).code, 0);

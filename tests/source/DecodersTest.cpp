@@ -101,6 +101,7 @@ TEST_P(DecodersFrom, GiveEveryPictureOnceWithItsTimeAndAllSound) {
     ASSERT_FALSE(beeps.empty());
     EXPECT_NEAR(beeps.back(), 3, 0.012);
     EXPECT_TRUE(movie.Complaints().empty()) << movie.Complaints()[0].Text();
+    EXPECT_TRUE(movie.Losses().empty()) << movie.Losses()[0].Text();
 
     // At the end they give nothing and stay there.
     EXPECT_LT(movie.Pictures()->DecodeNext(1), 1);
@@ -329,8 +330,9 @@ TEST(Decoders, TellWhatDoesNotFitIntoWhatBeganSmaller) {
     }
     EXPECT_NEAR(seen.pictures[10].luma, 235, 2);
     std::vector<std::string> told;
-    for (const auto& complaint : movie.Complaints())
-        told.push_back(complaint.Text());
+    for (const auto& texts : {movie.Losses(), movie.Complaints()})
+        for (const auto& text : texts)
+            told.push_back(text.Text());
     for (const char* text : {"some of its pictures have 320x240 and were fitted into those of 160x120",
                              "some of its sound has 6 channels and got 2"})
         EXPECT_EQ(std::count(told.begin(), told.end(), text), 1) << text;

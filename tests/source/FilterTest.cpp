@@ -41,7 +41,7 @@ Combed LookFor(const std::string& path, Deinterlace deinterlace) {
         if (movie.Pictures()->DecodeNext(1) < 1)
             break;
     }
-    for (const auto& complaint : movie.Complaints())
+    for (const auto& complaint : movie.Losses())
         if (complaint.Text().find("interlaced") != std::string::npos)
             seen.told = complaint.Text();
     seen.comb /= seen.pictures;
