@@ -204,6 +204,7 @@ av::Frame PictureConverter::Scale(const AVFrame& picture) {
                                converted->data, converted->linesize);
     if (rows <= 0)
         return nullptr;
+    narrowed_ = narrowed_ || (IsFullRange(picture) && !IsRgb(format));
     return size == whole ? std::move(converted) : Bordered(*converted, whole.width, whole.height);
 }
 

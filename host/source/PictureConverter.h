@@ -20,6 +20,9 @@ public:
     /// cannot be converted, as with a damaged size.
     av::Frame Convert(AVFrame& picture);
 
+    /// Whether any picture had the full range of levels, of which the usual range that it got has fewer.
+    bool Narrowed() const { return narrowed_; }
+
 private:
     struct Size {
         int width;
@@ -44,6 +47,7 @@ private:
     const Size stored_;
     const bool oneSize_; // otherwise pictures of the same shape of pixels keep their own size
     av::Scaler scaler_;
+    bool narrowed_ = false;
 };
 
 } // namespace movieconv

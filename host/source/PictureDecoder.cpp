@@ -124,6 +124,7 @@ void PictureDecoder::Run() {
     repaired_ = stamps_.Repaired();
     deinterlaced_ = filter_.Deinterlaced();
     leftInterlaced_ = filter_.LeftInterlaced();
+    narrowed_ = converter_.Narrowed();
     damaged_ = unconverted_ + decoder_->Damaged();
     queue_.Finish();
 }

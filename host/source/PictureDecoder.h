@@ -58,6 +58,7 @@ public:
     int64_t Repaired() const { return repaired_; }
     bool Deinterlaced() const { return deinterlaced_; }
     bool LeftInterlaced() const { return leftInterlaced_; }
+    bool Narrowed() const { return narrowed_; } ///< As PictureConverter has it.
     const PictureNotes& Notes() const { return notes_; }
 
     /// Whether the source's last picture has been decoded and handed on. Any thread.
@@ -114,6 +115,7 @@ private:
     std::atomic<int64_t> decodedTo_{0};
     std::atomic<bool> deinterlaced_{false};
     std::atomic<bool> leftInterlaced_{false};
+    std::atomic<bool> narrowed_{false};
     PictureNotes notes_;
     std::thread thread_;
 

@@ -31,6 +31,8 @@ std::vector<Sentence> PictureLosses(const PictureStreamInfo& pictures, const Sou
     if (decoder.LeftInterlaced())
         texts.push_back(Say("interlaced pictures stayed as they are, in files that do not tell it"));
     AddLossesOfLight(pictures, choice, texts);
+    if (decoder.Narrowed())
+        texts.push_back(Say("its pictures of full range got the usual one, which has fewer levels"));
     if (!pictures.fineColours.empty())
         texts.push_back(
             Say("its {} pictures keep their colours at half the resolution (4:2:0)", pictures.fineColours));

@@ -1,12 +1,15 @@
 // Interlaced, HDR and bordered pictures, measured where they are handed to the engine.
 #include "host/source/CropDetection.h"
 #include "host/source/Movie.h"
+#include "tests/support/Inspect.h"
 #include "tests/support/TestMovies.h"
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cstdlib>
 #include <string>
+#include <vector>
 
 namespace {
 
@@ -78,6 +81,30 @@ TEST(Filters, TakeTheCombFromPicturesThatSayTheyAreInterlaced) {
         EXPECT_EQ(seen.pictures, 50);
         EXPECT_EQ(seen.told, test.told);
         EXPECT_TRUE(test.comb ? seen.comb > 20 : seen.comb < 3) << seen.comb;
+    }
+}
+
+TEST(Filters, TellThatFullRangeBecomesTheUsualOne) {
+    const Args grey{"-f", "lavfi", "-i", "color=gray:s=64x48:r=25:d=0.2"};
+    const struct {
+        const char* name;
+        Args making;
+        bool told;
+    } cases[] = {
+        {"full.mkv", {"-vf", "scale=out_range=pc", "-color_range", "pc", "-c:v", "libx264"}, true},
+        {"usual.mkv", {"-vf", "scale=out_range=tv", "-color_range", "tv", "-c:v", "libx264"}, false},
+        {"full-jpeg.avi", {"-pix_fmt", "yuvj420p", "-c:v", "mjpeg"}, true},
+        {"rgb.mkv", {"-pix_fmt", "bgr0", "-c:v", "ffv1"}, false}, // these have no other range
+    };
+    for (const auto& test : cases) {
+        SCOPED_TRACE(test.name);
+        Movie movie(Make(test.name, Join(grey, test.making)), {});
+        inspect::TakeAll(movie);
+        const std::vector<movieconv::Sentence> losses = movie.Losses();
+        const bool told = std::any_of(losses.begin(), losses.end(), [](const auto& loss) {
+            return loss.Text() == "its pictures of full range got the usual one, which has fewer levels";
+        });
+        EXPECT_EQ(told, test.told);
     }
 }
 
