@@ -45,10 +45,6 @@ BurnWish BurnOf(const Request& request) {
     BurnWish wish{request.burnSubtitles, request.subtitleCharset, ToMediaTime(request.begin)};
     if (request.length)
         wish.end = ToMediaTime(request.begin + *request.length);
-    if (request.piece) {
-        wish.begin = request.piece->begin;
-        wish.end = request.piece->end;
-    }
     return wish;
 }
 

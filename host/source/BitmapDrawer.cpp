@@ -52,8 +52,7 @@ public:
           decoder_(list_.OpenDecoder({1, kTicksPerSecond})) {}
 
     bool Changes(int64_t time) override {
-        for (; next_ < list_.cues.size() && list_.cues[next_].begin <= time; ++next_)
-            Decode(list_.cues[next_]);
+        Advance(time);
         const bool isShown = latest_ && from_ <= time && time < until_;
         const bool changes = isShown != shown_ || (isShown && fresh_);
         shown_ = isShown;
@@ -75,7 +74,21 @@ public:
         return canvas;
     }
 
+    int64_t NextChange(int64_t time) override {
+        Advance(time);
+        int64_t next = next_ < list_.cues.size() ? list_.cues[next_].begin : kNever;
+        for (const int64_t change : {from_, until_})
+            if (latest_ && change > time)
+                next = std::min(next, change);
+        return next;
+    }
+
 private:
+    void Advance(int64_t time) {
+        for (; next_ < list_.cues.size() && list_.cues[next_].begin <= time; ++next_)
+            Decode(list_.cues[next_]);
+    }
+
     /// Of the whole pictures.
     int Width() const { return pictures_.width + pictures_.crop.left + pictures_.crop.right; }
     int Height() const { return pictures_.height + pictures_.crop.top + pictures_.crop.bottom; }

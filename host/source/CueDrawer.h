@@ -7,6 +7,7 @@
 #include "host/source/SourceInfo.h"
 
 #include <cstdint>
+#include <limits>
 #include <memory>
 #include <string>
 #include <vector>
@@ -30,6 +31,12 @@ public:
 
     /// That. Throws SourceError.
     virtual Canvas Draw(int64_t time) = 0;
+
+    /// From when on something else may be to be seen than at `time`; `time` itself where something moves,
+    /// kNever where nothing changes any more. What it gives depends on the time alone.
+    virtual int64_t NextChange(int64_t time) = 0;
+
+    static constexpr int64_t kNever = std::numeric_limits<int64_t>::max();
 };
 
 /// For pictures such as `pictures` tells, upright and cropped; positions are those in them. Fonts are for

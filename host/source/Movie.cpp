@@ -13,7 +13,7 @@ namespace movieconv {
 namespace {
 
 std::unique_ptr<SubtitleBurner> MakeBurner(const Source& source, const SourceChoice& choice) {
-    if (!choice.burn || choice.stampsOnly)
+    if (!choice.burn)
         return nullptr;
     if (source.PictureStream() == nullptr)
         throw TrackError(Say("there are no pictures to draw subtitles into"));
@@ -42,7 +42,7 @@ Movie::Movie(const std::string& path, const SourceChoice& choice, std::shared_pt
     if (choice.fromStart)
         demuxer_.StayAtStart();
     if (source_.PictureStream() != nullptr && choice.stampsOnly)
-        stamps_ = std::make_unique<PictureStamps>(source_, demuxer_);
+        stamps_ = std::make_unique<PictureStamps>(source_, demuxer_, burner_.get());
     else if (source_.PictureStream() != nullptr)
         pictures_ = std::make_unique<PictureDecoder>(source_, demuxer_, failures_, choice, burner_.get());
     if (source_.SoundStream() != nullptr)

@@ -180,6 +180,7 @@ bool PictureDecoder::Hold(AVFrame& picture, std::optional<int64_t> stamp) {
 /// or nobody takes it any more.
 bool PictureDecoder::Deliver(StampRepair::Stamp stamp, bool isLast) {
     decodedTo_ = stamp.time + stamp.duration;
+    const StampRepair::Stamp whole = stamp;
     const PictureRange::Place place = range_.Fit(stamp, isLast);
     refused_ = place == PictureRange::Place::kBehind;
     if (place != PictureRange::Place::kWithin)
@@ -189,15 +190,15 @@ bool PictureDecoder::Deliver(StampRepair::Stamp stamp, bool isLast) {
         ++unconverted_;
         return true;
     }
-    if (burner_ != nullptr)
-        burner_->Draw(*picture, stamp.time);
     range_.Gave();
     threads_.OnPicture(queue_.Size() == 0);
-    while (!refused_ && stamp.duration > 0) {
-        const StampRepair::Stamp one = TakeOffOne(stamp);
-        av::Frame given = av::CopyOf(*picture);
+    for (PictureStay stay(whole, stamp); !refused_ && !stay.IsOver();) {
+        const StampRepair::Stamp part = TakePart(stay, burner_);
+        av::Frame given = stay.IsOver() ? std::move(picture) : av::CopyOf(*picture);
+        if (burner_ != nullptr)
+            burner_->Draw(*given, part.time);
         const std::size_t bytes = Bytes(*given);
-        refused_ = !queue_.Push({std::move(given), one}, bytes);
+        refused_ = !queue_.Push({std::move(given), part}, bytes);
     }
     return !refused_;
 }

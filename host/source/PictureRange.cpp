@@ -26,14 +26,24 @@ PictureRange::Place PictureRange::Fit(StampRepair::Stamp& stamp, bool isLast) co
     return Place::kWithin;
 }
 
-StampRepair::Stamp TakeOffOne(StampRepair::Stamp& stay) {
+PictureStay::PictureStay(const StampRepair::Stamp& whole, const StampRepair::Stamp& fitted)
+    : rest_(fitted),
+      end_(whole.time + whole.duration),
+      isLong_(std::max(whole.duration, fitted.duration) > kTicksPerSecond / 4) {}
+
+StampRepair::Stamp PictureStay::Take(int64_t change) {
+    constexpr int64_t kShortest = kTicksPerSecond / 25;
     constexpr int64_t kLongest = 100 * kTicksPerSecond; // two of them are within the engine's 214 s
     constexpr int64_t kCredible = int64_t{24} * 3600 * kTicksPerSecond; // more is a fault of the stamps
-    const StampRepair::Stamp one{stay.time, std::min(stay.duration, kLongest)};
-    stay = stay.duration > kCredible
-               ? StampRepair::Stamp{}
-               : StampRepair::Stamp{one.time + one.duration, stay.duration - one.duration};
-    return one;
+    StampRepair::Stamp part{rest_.time, std::min(rest_.duration, kLongest)};
+    if (rest_.duration > kCredible) {
+        rest_ = {};
+        return part;
+    }
+    if (const int64_t cut = std::max(change, rest_.time + kShortest); isLong_ && cut <= end_ - kShortest)
+        part.duration = std::min(part.duration, cut - rest_.time);
+    rest_ = {part.time + part.duration, rest_.duration - part.duration};
+    return part;
 }
 
 void TellTimes(VideoImage& image, const StampRepair::Stamp& stamp) {

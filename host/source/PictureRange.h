@@ -36,9 +36,29 @@ private:
     bool first_ = true;
 };
 
-/// What can be told of a stay at once, since a record's duration has 32 bits. The rest of it stays in `stay`,
-/// with a duration of 0 where nothing is left: the same picture is handed out once more for that.
-StampRepair::Stamp TakeOffOne(StampRepair::Stamp& stay);
+/// How long one picture stays, in the parts for each of which it is handed out once. What divides it follows
+/// from the source alone, wherever a range begins or ends in it.
+class PictureStay {
+public:
+    PictureStay() = default;
+
+    /// `whole` became `fitted` by PictureRange.
+    PictureStay(const StampRepair::Stamp& whole, const StampRepair::Stamp& fitted);
+
+    bool IsOver() const { return rest_.duration <= 0; }
+
+    /// When the next part begins.
+    int64_t Time() const { return rest_.time; }
+
+    /// The next part: not more than a record can tell, and, of a picture that stays long, not beyond
+    /// `change`, from when on something else is drawn into it.
+    StampRepair::Stamp Take(int64_t change);
+
+private:
+    StampRepair::Stamp rest_;
+    int64_t end_ = 0; // whatever range ends before
+    bool isLong_ = false;
+};
 
 /// Enters the times into a picture's record.
 void TellTimes(VideoImage& image, const StampRepair::Stamp& stamp);

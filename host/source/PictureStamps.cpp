@@ -10,13 +10,14 @@ constexpr std::size_t kMostReordered = 32;
 
 } // namespace
 
-PictureStamps::PictureStamps(const Source& source, Demuxer& demuxer)
+PictureStamps::PictureStamps(const Source& source, Demuxer& demuxer, SubtitleBurner* burner)
     : reader_(source.Reader()),
       demuxer_(demuxer),
       stream_(source.PictureStream()->index),
       timeBase_(source.PictureStream()->time_base),
       codec_(source.PictureStream()->codecpar->codec_id),
-      repair_(ToMediaTime(1 / source.Info().pictures->frameRate)) {
+      repair_(ToMediaTime(1 / source.Info().pictures->frameRate)),
+      burner_(burner) {
     const PictureStreamInfo& pictures = *source.Info().pictures;
     info_.format = {pictures.width, pictures.height, CredibleRate(pictures), pictures.duration};
 }
@@ -45,15 +46,15 @@ int PictureStamps::DecodeNext(int /*mode*/) {
 }
 
 bool PictureStamps::Advance() {
-    while (rest_.duration <= 0) {
+    while (stay_.IsOver()) {
         const std::optional<StampRepair::Stamp> stamp = NextSettled();
         ranDry_ = !stamp;
         if (!stamp)
             return false;
-        rest_ = *stamp;
-        const PictureRange::Place place = range_.Fit(rest_, settledAll_);
-        if (place != PictureRange::Place::kWithin)
-            rest_ = {};
+        StampRepair::Stamp fitted = *stamp;
+        const PictureRange::Place place = range_.Fit(fitted, settledAll_);
+        if (place == PictureRange::Place::kWithin)
+            stay_ = {*stamp, fitted};
         if (place == PictureRange::Place::kBehind)
             return false;
     }
@@ -62,7 +63,7 @@ bool PictureStamps::Advance() {
     image_.nType = kMediaTypePicture;
     image_.nWidth = info_.format.nWidth;
     image_.nHeight = info_.format.nHeight;
-    TellTimes(image_, TakeOffOne(rest_));
+    TellTimes(image_, TakePart(stay_, burner_));
     return true;
 }
 

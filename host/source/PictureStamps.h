@@ -8,6 +8,7 @@
 #include "host/source/PictureRange.h"
 #include "host/source/Source.h"
 #include "host/source/StampRepair.h"
+#include "host/source/SubtitleBurner.h"
 #include "media/Decoders.h"
 
 #include <atomic>
@@ -22,7 +23,8 @@ namespace movieconv {
 /// Hands out the pictures that PictureDecoder would, with the same stamps and without planes.
 class PictureStamps final : public VideoDecoder {
 public:
-    PictureStamps(const Source& source, Demuxer& demuxer);
+    /// `burner` draws into those pictures, if there is one, and has to last as long.
+    PictureStamps(const Source& source, Demuxer& demuxer, SubtitleBurner* burner = nullptr);
 
     VideoSourceInfo* GetVideoInfo() override { return &info_; }
     double Seek(double seconds, int mode) override;
@@ -59,7 +61,8 @@ private:
     std::priority_queue<int64_t, std::vector<int64_t>, std::greater<>> decoded_; // of packets, in media time
     std::optional<int64_t> firstKey_; // when the first picture that can be decoded is shown
     PictureRange range_;
-    StampRepair::Stamp rest_; // of the current picture's stay
+    SubtitleBurner* const burner_;
+    PictureStay stay_; // the current picture's
     bool readAll_ = false;
     bool settledAll_ = false;
     bool repaired_ = false;

@@ -5,7 +5,9 @@
 #include "host/source/BurnWish.h"
 #include "host/source/CueDrawer.h"
 #include "host/source/Overlay.h"
+#include "host/source/PictureRange.h"
 #include "host/source/Source.h"
+#include "host/source/StampRepair.h"
 
 #include <cstdint>
 #include <memory>
@@ -21,11 +23,19 @@ public:
     /// rise. Throws SourceError.
     void Draw(AVFrame& picture, int64_t time);
 
+    /// As CueDrawer's.
+    int64_t NextChange(int64_t time) { return drawer_->NextChange(time); }
+
 private:
     const OverlayColours colours_;
     std::unique_ptr<CueDrawer> drawer_;
     Overlay overlay_;
 };
+
+/// The next part of a picture's stay, into all of which `burner`, if there is one, draws the same.
+inline StampRepair::Stamp TakePart(PictureStay& stay, SubtitleBurner* burner) {
+    return stay.Take(burner != nullptr ? burner->NextChange(stay.Time()) : CueDrawer::kNever);
+}
 
 } // namespace movieconv
 

@@ -192,20 +192,8 @@ public:
     }
 
     bool Changes(int64_t time) override {
-        const std::vector<Event>& events = script_.Events();
-        const int64_t now = time / kHundredth;
-        bool changes = false;
-        const auto ended = std::remove_if(active_.begin(), active_.end(),
-                                          [&](const Event* event) { return event->end <= now; });
-        changes = ended != active_.end();
-        active_.erase(ended, active_.end());
-        for (; next_ < events.size() && events[next_].begin <= now; ++next_)
-            if (events[next_].end > now) {
-                active_.push_back(&events[next_]);
-                changes = true;
-            }
-        return changes ||
-               std::any_of(active_.begin(), active_.end(), [](const Event* event) { return event->moves; });
+        Advance(time);
+        return std::exchange(changed_, false) || AnythingMoves();
     }
 
     Canvas Draw(int64_t time) override {
@@ -222,7 +210,38 @@ public:
         return drawn ? Trimmed(drawn->data[0], drawn->linesize[0], width_, height_) : Canvas{};
     }
 
+    int64_t NextChange(int64_t time) override {
+        Advance(time);
+        if (AnythingMoves())
+            return time;
+        int64_t next = kNever;
+        for (const Event* event : active_)
+            next = std::min(next, event->end * kHundredth);
+        if (next_ < script_.Events().size())
+            next = std::min(next, script_.Events()[next_].begin * kHundredth);
+        return next;
+    }
+
 private:
+    /// Finds out what is to be seen at `time`.
+    void Advance(int64_t time) {
+        const std::vector<Event>& events = script_.Events();
+        const int64_t now = time / kHundredth;
+        const auto ended = std::remove_if(active_.begin(), active_.end(),
+                                          [&](const Event* event) { return event->end <= now; });
+        changed_ = changed_ || ended != active_.end();
+        active_.erase(ended, active_.end());
+        for (; next_ < events.size() && events[next_].begin <= now; ++next_)
+            if (events[next_].end > now) {
+                active_.push_back(&events[next_]);
+                changed_ = true;
+            }
+    }
+
+    bool AnythingMoves() const {
+        return std::any_of(active_.begin(), active_.end(), [](const Event* event) { return event->moves; });
+    }
+
     /// Does `work` with the graph, whose errors are the source's.
     template <class Work>
     static void Drawing(Work work) {
@@ -260,6 +279,7 @@ private:
     std::optional<av::FilterGraph> graph_; // unless there is nothing to draw
     std::size_t next_ = 0;
     std::vector<const Event*> active_;
+    bool changed_ = false; // since it was asked for last
 };
 
 } // namespace

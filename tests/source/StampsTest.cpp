@@ -1,10 +1,13 @@
 #include "host/source/MediaTime.h"
 #include "host/source/PacketTime.h"
+#include "host/source/PictureRange.h"
 #include "host/source/SoundTimeline.h"
 #include "host/source/StampRepair.h"
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
+#include <cstdint>
 #include <optional>
 #include <vector>
 
@@ -50,6 +53,37 @@ TEST(StampRepair, KeepsRisingStampsAndMendsTheOthers) {
         EXPECT_EQ(times, test.times) << &test - cases;
         EXPECT_EQ(repair.Repaired(), test.repairs) << &test - cases;
     }
+}
+
+/// Pieces begin with parts and have to find the same ones as who reads from the start.
+TEST(PictureStay, IsDividedAlikeFromEachOfItsParts) {
+    constexpr int64_t kSecond = kTicksPerSecond;
+    const std::vector<int64_t> changes{kSecond, kSecond + 1, kSecond * 2, kSecond * 3 - 1, kSecond * 4};
+    const auto partsFrom = [&](int64_t begin, const StampRepair::Stamp& whole, int64_t end) {
+        std::vector<int64_t> times;
+        const StampRepair::Stamp fitted{begin, end - begin};
+        for (movieconv::PictureStay stay(whole, fitted); !stay.IsOver();) {
+            const auto next = std::upper_bound(changes.begin(), changes.end(), stay.Time());
+            const StampRepair::Stamp part = stay.Take(next == changes.end() ? INT64_MAX : *next);
+            times.push_back(part.time);
+            EXPECT_GT(part.duration, 0);
+        }
+        return times;
+    };
+    constexpr int64_t kLeast = kSecond / 25;
+    const StampRepair::Stamp whole{kSecond / 2, kSecond * 5 / 2};
+    const int64_t end = whole.time + whole.duration;
+    // One that is only just long enough to be a picture, and none of less than that at the end.
+    const std::vector<int64_t> parts{whole.time, kSecond, kSecond + kLeast, 2 * kSecond};
+    EXPECT_EQ(partsFrom(whole.time, whole, end), parts);
+    for (std::size_t i = 1; i < parts.size(); ++i) {
+        EXPECT_EQ(partsFrom(parts[i], whole, end),
+                  std::vector(parts.begin() + static_cast<long>(i), parts.end()));
+        EXPECT_EQ(partsFrom(whole.time, whole, parts[i]),
+                  std::vector(parts.begin(), parts.begin() + static_cast<long>(i)));
+    }
+    const StampRepair::Stamp usual{kSecond * 2 - kLeast / 2, kLeast};
+    EXPECT_EQ(partsFrom(usual.time, usual, usual.time + usual.duration), std::vector{usual.time});
 }
 
 TEST(PacketTime, StaysWithinWhatStampsCanTell) {

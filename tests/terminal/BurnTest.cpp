@@ -39,9 +39,10 @@ Box BrightPart(const unsigned char* picture, int width, int height) {
     return box;
 }
 
-/// Of every picture of a movie of that size.
-std::vector<Box> BoxesOf(const std::string& path, int width, int height) {
-    const std::string rows = FfmpegReads(path, Words("-map 0:v:0 -f rawvideo -pix_fmt gray"));
+/// Of every picture of a movie of that size, filtered so.
+std::vector<Box> BoxesOf(const std::string& path, int width, int height, const char* filter = "null") {
+    const std::string rows =
+        FfmpegReads(path, Join(Words("-map 0:v:0 -f rawvideo -pix_fmt gray -vf"), Args{filter}));
     const auto size = static_cast<size_t>(width) * static_cast<size_t>(height);
     EXPECT_EQ(rows.size() % size, 0);
     std::vector<Box> boxes;
@@ -151,6 +152,36 @@ TEST(Burn, GoesOnBehindJumpsOfTheClock) {
     EXPECT_NEAR(static_cast<double>(std::count(first.begin(), first.end(), '#')), 9, 1) << first;
     EXPECT_EQ(lines[0], first + first + first);
     EXPECT_EQ(lines[1], first + first);
+}
+
+/// Slides of 10 s, and a recording whose pictures come only when something happens: texts do not wait for the
+/// next picture.
+TEST(Burn, ComesAndGoesWhileOnePictureStays) {
+    const Folder folder;
+    Ffmpeg(Join(Lavfi("color=black:s=160x120:r=0.1:d=40"), Words("-c:v ffv1"), Args{folder / "slides.mkv"}));
+    Ffmpeg(Join(Lavfi("color=black:s=160x120:r=25:d=40"),
+                Args{"-vf", "select='lt(t,4.5)+not(mod(n,375))'", "-fps_mode", "vfr", "-c:v", "ffv1",
+                     folder / "screen.mkv"}));
+    WriteFile(folder / "a.srt", "1\n00:00:03,000 --> 00:00:06,000\nWORDS\n\n"
+                                "2\n00:00:12,000 --> 00:00:18,000\n{\\fad(100,100)}OTHERS\n");
+    WriteFile(folder / "a.sup", whole_movie::BitmapSubtitles({{3, 6}, {12, 18}}));
+    const std::string seconds = "...###......######............";
+    for (const char* movie : {"slides", "screen"}) {
+        for (const char* texts : {"a.srt", "a.sup"}) {
+            Ffmpeg({"-copyts", "-i", folder / movie + ".mkv", "-i", folder / texts, "-map", "0", "-map", "1",
+                    "-c", "copy", folder / "in.mkv"});
+            for (const Args& options :
+                 {Args{}, Args{"--frame-rate", "25"}, Args{"--jobs", "2", "--pieces", "5"}}) {
+                SCOPED_TRACE(std::string(movie) + " " + texts + " " + (options.empty() ? "" : options[0]));
+                const Result made = Call(Join(Args{folder / "in.mkv", folder / "out.mkv", "-y", "-q",
+                                                   "--video-codec", "FFV1", "--burn-subtitles", "1"},
+                                              options));
+                ASSERT_EQ(made.code, 0) << made.err;
+                EXPECT_EQ(Timeline(BoxesOf(folder / "out.mkv", 160, 120, "fps=1")).substr(0, seconds.size()),
+                          seconds);
+            }
+        }
+    }
 }
 
 TEST(Burn, StaysInItsPlaceWhenThePicturesChangeTheirSize) {
