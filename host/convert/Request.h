@@ -34,7 +34,8 @@ struct PieceCut {
     int64_t until = 0;           ///< Where the pictures end that its encoder looks at, `end` or later.
     bool last = false;           ///< No pictures follow.
     std::optional<int64_t> tick; ///< By the media writer's plan; nothing before the first picture shown.
-    bool fromStart = false;      ///< The source can only be read from its start.
+    int64_t drawnSince = 0; ///< When the first of the subtitles began that are drawn into its first picture.
+    bool fromStart = false; ///< The source can only be read from its start.
 };
 
 /// The clip with which a conversion into clips begins.

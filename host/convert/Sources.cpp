@@ -45,6 +45,8 @@ BurnWish BurnOf(const Request& request) {
     BurnWish wish{request.burnSubtitles, request.subtitleCharset, ToMediaTime(request.begin)};
     if (request.length)
         wish.end = ToMediaTime(request.begin + *request.length);
+    if (request.piece && request.piece->pictures)
+        wish.earliest = request.piece->drawnSince;
     return wish;
 }
 

@@ -32,6 +32,7 @@ Request RequestFor(const Plan& plan, int number, const std::string& output) {
         cut.until = piece.until;
         cut.last = place + 1 == plan.pictures.size();
         cut.tick = piece.tick;
+        cut.drawnSince = piece.drawnSince;
         if (number > 0)
             request.begin = ToSeconds(piece.begin);
         request.length = ToSeconds(piece.until - piece.begin);

@@ -30,6 +30,7 @@ struct Piece {
     int64_t until = 0;           ///< Where the pictures end that its encoder looks at, `end` or later.
     int64_t pictures = 0;        ///< Of the source.
     std::optional<int64_t> tick; ///< See PieceCut.
+    int64_t drawnSince = 0;      ///< See PieceCut.
     bool operator==(const Piece&) const = default;
 };
 

@@ -30,6 +30,8 @@ Json AsJson(const Piece& piece) {
               {"pictures", piece.pictures}};
     if (piece.tick)
         json["tickBefore"] = *piece.tick;
+    if (piece.drawnSince != piece.begin)
+        json["drawnSince"] = piece.drawnSince;
     return json;
 }
 
@@ -83,6 +85,7 @@ Piece PieceFrom(const Json& json) {
     piece.pictures = Natural(json, "pictures");
     if (json.contains("tickBefore"))
         piece.tick = json.at("tickBefore").get<int64_t>();
+    piece.drawnSince = json.contains("drawnSince") ? json.at("drawnSince").get<int64_t>() : piece.begin;
     if (json.at("kind") != "pictures" || piece.end <= piece.begin || piece.until < piece.end ||
         piece.pictures < 1)
         RefusePlan("a piece holds no pictures");

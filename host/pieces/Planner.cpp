@@ -186,7 +186,7 @@ std::size_t PicturesAhead(const EncodeParam& param, const Request& request, cons
 }
 
 /// The pieces that begin with the pictures `firsts`.
-std::vector<Piece> PiecesOf(const Stamps& stamps, const std::vector<std::size_t>& firsts,
+std::vector<Piece> PiecesOf(const Movie& movie, const Stamps& stamps, const std::vector<std::size_t>& firsts,
                             const std::vector<std::optional<int64_t>>& ticks, std::size_t ahead) {
     const auto timeOf = [&](std::size_t picture) {
         return picture < stamps.times.size() ? stamps.times[picture]
@@ -199,7 +199,8 @@ std::vector<Piece> PiecesOf(const Stamps& stamps, const std::vector<std::size_t>
                           .end = timeOf(next),
                           .until = timeOf(next + ahead),
                           .pictures = static_cast<int64_t>(next - firsts[i]),
-                          .tick = ticks[firsts[i]]});
+                          .tick = ticks[firsts[i]],
+                          .drawnSince = movie.DrawnSince(stamps.times[firsts[i]])});
     }
     return pieces;
 }
@@ -247,7 +248,7 @@ std::optional<Plan> MakePlan(Plan plan, const std::function<bool()>& stopped) {
         throw Failure(Category::kRequest, fmt::format("that makes {} pieces; at most {} can be made",
                                                       firsts.size(), kMostPieces));
     const EncodeParam param = ParamFor(request, movie);
-    plan.pictures = PiecesOf(*stamps, firsts, TicksBefore(param, request, movie, *stamps),
+    plan.pictures = PiecesOf(movie, *stamps, firsts, TicksBefore(param, request, movie, *stamps),
                              PicturesAhead(param, request, movie.Info()));
     return plan;
 }

@@ -3,7 +3,6 @@
 #include "host/sentence/Say.h"
 #include "host/source/Charset.h"
 #include "host/source/CueSettings.h"
-#include "host/source/EarlierCues.h"
 #include "host/source/MediaTime.h"
 
 #include <algorithm>
@@ -50,7 +49,7 @@ BesidePackets& BesideTracks::ReadPackets(int stream) {
     BesidePackets& track = Add(
         stream, std::make_unique<BesidePackets>(take, clock, StreamOf(stream).time_base, bounds_, failures_));
     if (bounds_.begin > 0) {
-        std::vector<av::Packet> earlier = EarlierCues(stream);
+        std::vector<av::Packet> earlier = CuesBefore(stream);
         for (const av::Packet& packet : earlier)
             toUsualForm(*packet);
         track.Precede(std::move(earlier));
@@ -102,7 +101,7 @@ const AVStream& BesideTracks::StreamOf(int stream) const {
 }
 
 /// Those of all subtitles are read at once. A source that cannot be sought is read from its start, with them.
-std::vector<av::Packet> BesideTracks::EarlierCues(int stream) {
+std::vector<av::Packet> BesideTracks::CuesBefore(int stream) {
     const SourceInfo& info = source_.Info();
     if (!std::exchange(earlierCuesRead_, true) && source_.Reader().IsSeekable() && !info.clockRestarts) {
         std::vector<int> subtitles;
@@ -113,7 +112,7 @@ std::vector<av::Packet> BesideTracks::EarlierCues(int stream) {
         MovieReader again(info.path, choice_.playlists, Growth::kRead, source_.Reader().Interruptible());
         earlierCues_ = ReadEarlierCues(again, main, std::move(subtitles), bounds_.begin);
     }
-    return std::move(earlierCues_[stream]);
+    return std::move(earlierCues_.packets[stream]);
 }
 
 bool BesideTracks::Copies(int stream) const {
@@ -122,6 +121,8 @@ bool BesideTracks::Copies(int stream) const {
 
 std::vector<Sentence> BesideTracks::Complaints() const {
     std::vector<Sentence> texts;
+    if (Sentence unread = TellEarliestCue(earlierCues_.earliest, bounds_.begin); !unread.IsEmpty())
+        texts.push_back(std::move(unread));
     if (const int64_t cues = cuesInOtherCharset_; cues > 0)
         texts.push_back(cues == 1
                             ? Say("1 of its subtitles was not in UTF-8 and taken for Windows-1252")

@@ -5,6 +5,7 @@
 #include "host/source/BesideTrack.h"
 #include "host/source/CopiedSound.h"
 #include "host/source/Demuxer.h"
+#include "host/source/EarlierCues.h"
 #include "host/source/Failures.h"
 #include "host/source/Source.h"
 #include "host/source/SubtitleFile.h"
@@ -58,7 +59,7 @@ private:
     template <class Track>
     Track& Add(int stream, std::unique_ptr<Track> track);
     const AVStream& StreamOf(int stream) const;
-    std::vector<av::Packet> EarlierCues(int stream);
+    std::vector<av::Packet> CuesBefore(int stream);
 
     Source& source_;
     const SourceChoice& choice_;
@@ -66,7 +67,7 @@ private:
     Failures& failures_;
     double begin_ = 0; // seconds
     BesideBounds bounds_;
-    std::map<int, std::vector<av::Packet>> earlierCues_; // by stream, from before the begin
+    EarlierCues earlierCues_;
     bool earlierCuesRead_ = false;
     std::atomic<int64_t> cuesInOtherCharset_{0};
     std::vector<int> streams_; // that are read

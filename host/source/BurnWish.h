@@ -4,6 +4,7 @@
 
 #include <cstdint>
 #include <limits>
+#include <optional>
 #include <string>
 
 namespace movieconv {
@@ -13,6 +14,7 @@ struct BurnWish {
     std::string charset; ///< Of a file; empty: it is looked at.
     int64_t begin = 0;   ///< Media time between which pictures are converted.
     int64_t end = std::numeric_limits<int64_t>::max();
+    std::optional<int64_t> earliest{}; ///< Where the first one begins that is shown at the begin, if known.
 };
 
 /// Whether it names a stream of the source.

@@ -2,6 +2,7 @@
 
 #include "host/sentence/Say.h"
 #include "host/source/Charset.h"
+#include "host/source/EarlierCues.h"
 #include "host/source/MediaTime.h"
 #include "host/source/PacketClock.h"
 #include "host/source/PacketTime.h"
@@ -10,13 +11,13 @@
 #include "host/source/SubtitleFile.h"
 
 #include <algorithm>
+#include <limits>
 #include <memory>
 #include <utility>
 
 namespace movieconv {
 namespace {
 
-constexpr int64_t kFarthest = 60 * kTicksPerSecond; // before the begin, of what may last into it
 constexpr int64_t kLongestCue = 24LL * 60 * 60 * kTicksPerSecond;
 
 void CheckDecodable(const AVCodecParameters& parameters, const BurnWish& wish) {
@@ -58,8 +59,12 @@ void ReadStream(CueList& list, const Source& source, const BurnWish& wish, bool 
     reader.Select({stream});
     PacketClock clock(source.Info(), reader);
     reader.SelectBeside(clock.Witnesses());
-    if (wish.begin > kFarthest && !source.Info().clockRestarts) {
-        const int64_t from = reader.Start() + wish.begin - kFarthest;
+    constexpr int64_t kMargin = 60 * kTicksPerSecond; // texts stand in front of pictures of the same time
+    const int64_t earliest = wish.earliest ? *wish.earliest - kMargin : EarliestCueFor(reader, wish.begin);
+    if (earliest > 0 && !source.Info().clockRestarts) {
+        if (!wish.earliest)
+            list.unread = TellEarliestCue(earliest, wish.begin);
+        const int64_t from = reader.Start() + earliest;
         const int64_t target = av_rescale_q(from, {1, kTicksPerSecond}, av_get_time_base_q());
         if (avformat_seek_file(context, -1, INT64_MIN, target, target, 0) < 0 && !reader.Rewind())
             throw TrackError(Say("the subtitles cannot be read ahead of the pictures"));
@@ -115,6 +120,18 @@ av::CodecContext CueList::OpenDecoder(AVRational timeBase) const {
     if (result < 0)
         throw TrackError(Say("the subtitles cannot be decoded: {}", Sentence(av::ErrorText(result))));
     return decoder;
+}
+
+std::vector<CueList::Span> CueList::Spans() const {
+    std::vector<Span> spans;
+    int64_t next = std::numeric_limits<int64_t>::max(); // where the one behind those that begin together does
+    for (auto cue = cues.rbegin(); cue != cues.rend(); ++cue) {
+        if (!spans.empty() && spans.back().begin > cue->begin)
+            next = spans.back().begin;
+        spans.push_back({cue->begin, cue->end > cue->begin ? cue->end : next});
+    }
+    std::reverse(spans.begin(), spans.end());
+    return spans;
 }
 
 bool CueList::IsText() const {

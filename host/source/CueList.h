@@ -3,6 +3,7 @@
 #define MOVIECONV_HOST_SOURCE_CUELIST_H
 
 #include "ffmpeg/AvHandles.h"
+#include "host/sentence/Sentence.h"
 #include "host/source/BurnWish.h"
 #include "host/source/Source.h"
 
@@ -20,6 +21,14 @@ struct CueList {
 
     av::CodecParameters parameters;
     std::vector<Cue> cues; ///< By their begins.
+    Sentence unread;       ///< What was not looked for; empty where all was.
+
+    /// From when to when each is shown at most.
+    struct Span {
+        int64_t begin = 0;
+        int64_t end = 0;
+    };
+    std::vector<Span> Spans() const;
 
     bool IsText() const;
 

@@ -2,6 +2,7 @@
 #ifndef MOVIECONV_HOST_SOURCE_EARLIERCUES_H
 #define MOVIECONV_HOST_SOURCE_EARLIERCUES_H
 
+#include "host/sentence/Sentence.h"
 #include "host/source/MovieReader.h"
 
 #include <cstdint>
@@ -10,11 +11,21 @@
 
 namespace movieconv {
 
-/// Their packets by stream, those that begin within a minute before `begin` (media time). Where pictures can
-/// be decoded from, containers give none of them. `main` is the stream that tells how far reading is, `file`
-/// has just been opened. Empty when it cannot be sought.
-std::map<int, std::vector<av::Packet>> ReadEarlierCues(MovieReader& file, int main, std::vector<int> streams,
-                                                       int64_t begin);
+/// Since when they have to have begun to be found (media time): all, as far as reading them takes seconds,
+/// those of the last minute in any case.
+int64_t EarliestCueFor(const MovieReader& file, int64_t begin);
+
+/// Tells what was not looked for; empty where `earliest` is the source's start.
+Sentence TellEarliestCue(int64_t earliest, int64_t begin);
+
+struct EarlierCues {
+    std::map<int, std::vector<av::Packet>> packets; ///< By stream.
+    int64_t earliest = 0;                           ///< See EarliestCueFor.
+};
+
+/// Where pictures can be decoded from, containers give none of them. `main` is the stream that tells how far
+/// reading is, `file` has just been opened. None when it cannot be sought.
+EarlierCues ReadEarlierCues(MovieReader& file, int main, std::vector<int> streams, int64_t begin);
 
 } // namespace movieconv
 

@@ -172,6 +172,11 @@ std::vector<Sentence> Movie::Complaints() const {
             Say("some of its sound has {} channels and got {}", sound_->Channels(), Info().sound->channels));
     for (Sentence& text : beside_.Complaints())
         texts.push_back(std::move(text));
+    const auto isNew = [&](const Sentence& text) {
+        return !text.IsEmpty() && std::find(texts.begin(), texts.end(), text) == texts.end();
+    };
+    if (burner_ && isNew(burner_->Unread()))
+        texts.push_back(burner_->Unread());
     return texts;
 }
 

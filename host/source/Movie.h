@@ -77,6 +77,9 @@ public:
     bool StampIsRepaired() const { return stamps_ && stamps_->IsRepaired(); }
     int64_t UnstampedPictures() const { return stamps_ ? stamps_->Unstamped() : 0; }
 
+    /// When the first of the subtitles that are drawn began that is still shown at `time`, in media time.
+    int64_t DrawnSince(int64_t time) const { return burner_ ? burner_->ShownSince(time) : time; }
+
     /// Times that the source's clock jumped and was put right. Once the pictures ended.
     int ClockJumps() const { return demuxer_.ClockJumps(); }
 

@@ -1,11 +1,9 @@
 #include "host/source/SubtitleBurner.h"
 
 #include "host/source/ColourMatrix.h"
-#include "host/source/CueList.h"
 
 #include <algorithm>
 #include <utility>
-#include <vector>
 
 namespace movieconv {
 namespace {
@@ -47,11 +45,20 @@ std::vector<FontFile> FontsOf(const Source& source) {
 SubtitleBurner::SubtitleBurner(const Source& source, const SourceChoice& choice)
     : colours_(ColoursFor(*source.Info().pictures, choice.keepHdr)) {
     CueList list = ReadCues(source, *choice.burn, choice.playlists);
+    spans_ = list.Spans();
+    unread_ = list.unread;
     const PictureStreamInfo& pictures = *source.Info().pictures;
     if (list.IsText())
         drawer_ = MakeTextDrawer(std::move(list), pictures, FontsOf(source));
     else
         drawer_ = MakeBitmapDrawer(std::move(list), pictures);
+}
+
+int64_t SubtitleBurner::ShownSince(int64_t time) const {
+    const auto found = std::find_if(spans_.begin(), spans_.end(), [time](const CueList::Span& span) {
+        return span.begin >= time || span.end > time;
+    });
+    return found != spans_.end() ? std::min(found->begin, time) : time;
 }
 
 void SubtitleBurner::Draw(AVFrame& picture, int64_t time) {

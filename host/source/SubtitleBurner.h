@@ -2,8 +2,10 @@
 #ifndef MOVIECONV_HOST_SOURCE_SUBTITLEBURNER_H
 #define MOVIECONV_HOST_SOURCE_SUBTITLEBURNER_H
 
+#include "host/sentence/Sentence.h"
 #include "host/source/BurnWish.h"
 #include "host/source/CueDrawer.h"
+#include "host/source/CueList.h"
 #include "host/source/Overlay.h"
 #include "host/source/PictureRange.h"
 #include "host/source/Source.h"
@@ -11,6 +13,7 @@
 
 #include <cstdint>
 #include <memory>
+#include <vector>
 
 namespace movieconv {
 
@@ -26,8 +29,16 @@ public:
     /// As CueDrawer's.
     int64_t NextChange(int64_t time) { return drawer_->NextChange(time); }
 
+    /// When the first of those began that are still shown at `time`; `time` where there is none.
+    int64_t ShownSince(int64_t time) const;
+
+    /// What was not looked for; empty where all was.
+    const Sentence& Unread() const { return unread_; }
+
 private:
     const OverlayColours colours_;
+    std::vector<CueList::Span> spans_;
+    Sentence unread_;
     std::unique_ptr<CueDrawer> drawer_;
     Overlay overlay_;
 };

@@ -6,6 +6,8 @@
 
 #include <algorithm>
 #include <cstdlib>
+#include <filesystem>
+#include <fmt/format.h>
 #include <gtest/gtest.h>
 
 namespace {
@@ -152,6 +154,48 @@ TEST(Burn, GoesOnBehindJumpsOfTheClock) {
     EXPECT_NEAR(static_cast<double>(std::count(first.begin(), first.end(), '#')), 9, 1) << first;
     EXPECT_EQ(lines[0], first + first + first);
     EXPECT_EQ(lines[1], first + first);
+}
+
+/// Whether it is drawn or carried; and where looking for it would take long, that it was not looked for.
+TEST(Burn, IsThereHoweverLongBeforeTheBeginItAppeared) {
+    const Folder folder;
+    std::string texts =
+        "1\n00:00:05,000 --> 00:02:55,000\nLONG\n\n"; // and others, lest it is the last one before
+    for (int second = 5; second < 175; second += 4)
+        texts += fmt::format("2\n{0}:{1:02},000 --> {0}:{2:02},000\nSHORT\n\n",
+                             fmt::format("00:{:02}", second / 60), second % 60, second % 60 + 1);
+    WriteFile(folder / "a.srt", texts);
+    Ffmpeg(Join(Lavfi("color=black:s=160x120:r=1:d=180"),
+                Args{"-i", folder / "a.srt", "-c:v", "ffv1", "-c:s", "srt", folder / "in.mkv"}));
+    const std::string whole = std::string(5, '.') + std::string(170, '#') + std::string(5, '.');
+    const struct {
+        Args options;
+        std::string line;
+    } cases[] = {{{"--begin", "2:00"}, whole.substr(120)},
+                 {{"--jobs", "2", "--pieces", "3"}, whole},
+                 {{"--begin", "2:00", "--jobs", "2", "--pieces", "3"}, whole.substr(120)}};
+    const Args burn{
+        folder / "in.mkv", folder / "out.mkv", "-y", "-q", "--burn-subtitles", "1", "--video-codec", "FFV1"};
+    for (const auto& test : cases) {
+        const Result made = Call(Join(burn, test.options));
+        EXPECT_EQ(made.code, 0) << made.err;
+        EXPECT_EQ(Timeline(BoxesOf(folder / "out.mkv", 160, 120)), test.line) << test.options.front();
+    }
+    const Args carry{folder / "in.mkv", folder / "out.mkv", "-y", "--begin", "2:00", "--length", "20"};
+    const auto told = [](const Result& made) {
+        return made.err.find("subtitles that appeared more than 90 s before the begin") != std::string::npos;
+    };
+    Result made = Call(carry);
+    EXPECT_EQ(made.code, 0) << made.err;
+    EXPECT_FALSE(told(made)) << made.err;
+    const std::vector<whole_movie::Cue> cues = whole_movie::CuesOf(folder / "out.mkv", 0);
+    ASSERT_FALSE(cues.empty());
+    EXPECT_EQ(cues[0].text, "LONG");
+    EXPECT_EQ(cues[0].begin, 0);
+    std::filesystem::resize_file(folder / "in.mkv", uintmax_t{1} << 31);
+    made = Call(carry);
+    EXPECT_EQ(made.code, 0) << made.err;
+    EXPECT_TRUE(told(made)) << made.err;
 }
 
 /// Slides of 10 s, and a recording whose pictures come only when something happens: texts do not wait for the

@@ -1249,6 +1249,10 @@
         <source>none of its sound from {} to its end at {} could be decoded</source>
         <translation>von seinem Ton ließ sich von {} bis zum Ende bei {} nichts dekodieren</translation>
     </message>
+    <message>
+        <source>subtitles that appeared more than {:.0f} s before the begin and may still be shown there were not looked for</source>
+        <translation>Untertitel, die mehr als {} s vor dem Beginn erschienen sind und dort noch zu sehen sein können, wurden nicht gesucht</translation>
+    </message>
 </context>
 <context>
     <name>LogShare</name>
