@@ -64,6 +64,10 @@ std::string UsualTextCodec(const std::string& path) {
                                                                                     : "subrip";
 }
 
+NotCarried LostOfChapters(Sentence reason) {
+    return {"chapters", std::nullopt, {}, {}, std::move(reason)};
+}
+
 } // namespace
 
 CarryPlan::CarryPlan(const SourceInfo& source, const Request& request, const FileFormatInfo& format)
@@ -136,13 +140,21 @@ Sentence CarryPlan::WhySoundStays(const StreamInfo& stream) const {
     return {};
 }
 
+/// What chapters do to the movie itself, which no output shows, whether they are carried or not.
+void CarryPlan::AddUnfollowedChapters(std::vector<NotCarried>& left) const {
+    if (source_.chaptersOrder)
+        left.push_back(
+            LostOfChapters(Say("the order in which they play parts of the movie is not followed")));
+    if (const int count = source_.foreignChapters; count > 0)
+        left.push_back(
+            LostOfChapters(Say("{} of them stand for parts of other files, which are not played", count)));
+}
+
 /// What no output holds of chapters: what FFmpeg does not read, and what has no place in the movie.
 void CarryPlan::AddLostChapters(std::vector<NotCarried>& left) const {
     if (request_.noChapters)
         return;
-    const auto tell = [&](Sentence reason) {
-        left.push_back({"chapters", std::nullopt, {}, {}, std::move(reason)});
-    };
+    const auto tell = [&](Sentence reason) { left.push_back(LostOfChapters(std::move(reason))); };
     if (const int count = source_.unreadChapters; count > 0)
         tell(Say("{} of them are in other editions or within others", count));
     if (const int count = source_.disorderedChapters; count > 0)
@@ -172,6 +184,7 @@ std::optional<NotCarried> CarryPlan::LostCoverTitle() const {
 
 std::vector<NotCarried> CarryPlan::LostByFormat() const {
     std::vector<NotCarried> left = LostTexts(source_, request_, format_);
+    AddUnfollowedChapters(left);
     if (std::optional<NotCarried> chapters = WhyChaptersStay(source_, request_, format_))
         left.push_back(*std::move(chapters));
     else

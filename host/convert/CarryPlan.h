@@ -38,6 +38,7 @@ public:
 
 private:
     Sentence WhySoundStays(const StreamInfo& stream) const;
+    void AddUnfollowedChapters(std::vector<NotCarried>& left) const;
     void AddLostChapters(std::vector<NotCarried>& left) const;
     std::optional<NotCarried> LostCoverTitle() const;
 

@@ -6,6 +6,7 @@
 #include "host/source/InputFile.h"
 #include "host/source/TrackWishes.h"
 
+#include <cstdint>
 #include <string>
 #include <vector>
 
@@ -29,12 +30,14 @@ struct ContainerNotes {
     std::vector<Stream> streams; ///< For each stream of FFmpeg's.
 
     // Of Matroska:
-    std::string title;          ///< Where a tag of that name hides it.
-    std::vector<Tag> repeated;  ///< Texts that are there several times: all of them, ";" in between.
-    std::vector<File> files;    ///< Attached ones that are described.
-    int chapters = 0;           ///< All there are, of every edition and within each other.
-    int disordered = 0;         ///< Of the first edition, those that begin before one in front of them.
-    std::vector<Titles> titles; ///< Of each chapter that has several, in several languages.
+    std::string title;             ///< Where a tag of that name hides it.
+    std::vector<Tag> repeated;     ///< Texts that are there several times: all of them, ";" in between.
+    std::vector<File> files;       ///< Attached ones that are described.
+    int chapters = 0;              ///< All there are, of every edition and within each other.
+    int disordered = 0;            ///< Of the first edition, those that begin before one in front of them.
+    std::vector<Titles> titles;    ///< Of each chapter that has several, in several languages.
+    bool ordersParts = false;      ///< Players show what the chapters name, in their order.
+    std::vector<uint64_t> foreign; ///< The chapters, by their numbers, that stand for parts of other files.
 };
 
 ContainerNotes ReadContainerNotes(const InputFile& file, const AVFormatContext& context);

@@ -17,7 +17,11 @@ constexpr uint64_t kTrackLanguage = 0x22B59D;
 constexpr uint64_t kTrackCodec = 0x86;
 constexpr uint64_t kChapters = 0x1043A770;
 constexpr uint64_t kEdition = 0x45B9;
+constexpr uint64_t kEditionDefault = 0x45DB;
+constexpr uint64_t kEditionOrdered = 0x45DD;
 constexpr uint64_t kChapter = 0xB6;
+constexpr uint64_t kChapterNumber = 0x73C4;
+constexpr uint64_t kChapterFile = 0x6E67;
 constexpr uint64_t kChapterBegin = 0x91;
 constexpr uint64_t kChapterDisplay = 0x80;
 constexpr uint64_t kChapterTitle = 0x85;
@@ -52,11 +56,7 @@ public:
     ContainerNotes Read() {
         notes_.title = Text(segment_.Locate(kMatroskaInfo), kTitle, kLongestName);
         ReadTracks();
-        segment_.ForEach(segment_.Locate(kChapters), kEdition, [this](const Part& edition) {
-            if (notes_.chapters == 0)
-                CountDisordered(edition);
-            ReadChapters(edition, 0);
-        });
+        ReadEditions();
         segment_.ForEach(segment_.Locate(kAttachments), kFile, [this](const Part& file) {
             if (std::string description = Text(file, kFileDescription, kLongestText); !description.empty())
                 notes_.files.push_back({Text(file, kFileName, kLongestName), std::move(description)});
@@ -78,6 +78,21 @@ private:
         });
     }
 
+    /// Players follow the one that is marked, or else the first.
+    void ReadEditions() {
+        bool isMarked = false;
+        segment_.ForEach(segment_.Locate(kChapters), kEdition, [&](const Part& edition) {
+            const bool isFirst = notes_.chapters == 0;
+            const bool marks = elements_.Number(elements_.Find(edition, kEditionDefault)) != 0;
+            if (isFirst)
+                CountDisordered(edition);
+            if (isFirst || (marks && !isMarked))
+                notes_.ordersParts = elements_.Number(elements_.Find(edition, kEditionOrdered)) != 0;
+            isMarked = isMarked || marks;
+            ReadChapters(edition, 0);
+        });
+    }
+
     /// Those in `whole`, an edition or a chapter.
     void ReadChapters(const Part& whole, int depth) {
         constexpr int kDeepest = 8;
@@ -87,6 +102,8 @@ private:
             ++notes_.chapters;
             if (depth == 0)
                 ReadTitles(chapter);
+            if (elements_.Find(chapter, kChapterFile).name == kChapterFile)
+                notes_.foreign.push_back(elements_.Number(elements_.Find(chapter, kChapterNumber)));
             ReadChapters(chapter, depth + 1);
         });
     }

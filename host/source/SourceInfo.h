@@ -149,6 +149,7 @@ struct Chapter {
     double end = 0;
     std::string title;
     std::vector<Tag> tags; ///< But for the title.
+    int64_t number = 0;    ///< The container's.
 };
 
 struct SourceInfo {
@@ -161,6 +162,8 @@ struct SourceInfo {
     std::vector<Chapter> chapters;
     int unreadChapters = 0;     ///< Others, of further editions or within these.
     int disorderedChapters = 0; ///< Others that stand behind later ones.
+    int foreignChapters = 0;    ///< Others, which stand for parts of other files.
+    bool chaptersOrder = false; ///< Players show the parts that the chapters name, in their order.
     int furtherTitles = 0;      ///< Chapters with titles in further languages, which are none of the above.
     std::vector<Tag> tags;      ///< What people wrote about the movie.
 

@@ -7,6 +7,7 @@
 #include <algorithm>
 #include <cctype>
 #include <cstddef>
+#include <cstdint>
 #include <string>
 #include <vector>
 
@@ -143,6 +144,13 @@ void TakeNotes(const ContainerNotes& notes, SourceInfo& info) {
     const int unread = std::max(notes.chapters - static_cast<int>(info.chapters.size()), 0);
     info.disorderedChapters = std::min(notes.disordered, unread);
     info.unreadChapters = unread - info.disorderedChapters;
+    info.chaptersOrder = notes.ordersParts;
+    const auto own = std::remove_if(info.chapters.begin(), info.chapters.end(), [&](const Chapter& chapter) {
+        return std::count(notes.foreign.begin(), notes.foreign.end(), static_cast<uint64_t>(chapter.number)) >
+               0;
+    });
+    info.foreignChapters = static_cast<int>(info.chapters.end() - own);
+    info.chapters.erase(own, info.chapters.end());
 }
 
 void PutTextsRight(std::string_view container, SourceInfo& info) {

@@ -344,7 +344,8 @@ std::vector<Chapter> DescribeChapters(const AVFormatContext& context, int64_t st
         const AVChapter& chapter = *context.chapters[i];
         chapters.push_back({SecondsFrom(start, chapter.start, chapter.time_base),
                             SecondsFrom(start, chapter.end, chapter.time_base),
-                            TagOf(chapter.metadata, "title"), TagsWithout(chapter.metadata, "title")});
+                            TagOf(chapter.metadata, "title"), TagsWithout(chapter.metadata, "title"),
+                            chapter.id});
     }
     return chapters;
 }

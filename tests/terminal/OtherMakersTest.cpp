@@ -326,6 +326,59 @@ TEST(OtherMakers, MatroskaIsReadToItsEnd) {
     EXPECT_EQ(whole_movie::Probe(folder / "c.mp4")["format"]["tags"].value("artist", ""), "Anna;Ben");
 }
 
+/// An edition whose chapters play the movie's second half first, and then a part of another file.
+TEST(OtherMakers, ChaptersThatPlayPartsInAnOrderAreTold) {
+    if (program::Run({"sh", "-c", "command -v mkvmerge"}).code != 0)
+        GTEST_SKIP() << "without mkvmerge";
+    const Folder folder;
+    const auto chapter = [](const char* begin, const char* end, const std::string& more) {
+        return std::string("<ChapterAtom><ChapterTimeStart>00:00:00.") + begin +
+               "</ChapterTimeStart><ChapterTimeEnd>00:00:00." + end + "</ChapterTimeEnd>" + more +
+               "<ChapterDisplay><ChapterString>C</ChapterString><ChapterLanguage>eng</ChapterLanguage>"
+               "</ChapterDisplay></ChapterAtom>";
+    };
+    const std::string foreign =
+        "<ChapterSegmentUID format=\"hex\">" + std::string(32, 'a') + "</ChapterSegmentUID>";
+    const auto edition = [&](const char* flags) {
+        return std::string("<EditionEntry>") + flags + chapter("000", "400", "") +
+               chapter("400", "500", foreign) + chapter("500", "900", "") + "</EditionEntry>";
+    };
+    const std::string order =
+        "movieconv: not carried: chapters: the order in which they play parts of the movie is not followed\n";
+    const std::string file =
+        "movieconv: not carried: chapters: 1 of them stand for parts of other files, which are not played\n";
+    const std::string others =
+        "movieconv: not carried: chapters: 3 of them are in other editions or within others\n";
+    constexpr char kOrdered[] = "<EditionFlagOrdered>1</EditionFlagOrdered>";
+    const std::string plain = edition("<EditionFlagDefault>1</EditionFlagDefault>");
+    const struct {
+        std::string editions;
+        Args options;
+        std::string told;
+    } cases[] = {{edition(kOrdered), {}, order + file},
+                 {edition(kOrdered), {"--no-chapters"}, order + file},
+                 {edition(kOrdered) + plain, {}, file + others}};
+    ASSERT_EQ(program::Run(Join(Args{"ffmpeg", "-v", "error"}, CountedPictures(1),
+                                Args{"-c:v", "mpeg4", folder / "plain.mkv"}))
+                  .code,
+              0);
+    for (const auto& test : cases) {
+        WriteFile(folder / "chapters.xml",
+                  "<?xml version=\"1.0\"?><Chapters>" + test.editions + "</Chapters>");
+        ASSERT_EQ(program::Run({"mkvmerge", "-q", "-o", folder / "in.mkv", "--chapters",
+                                folder / "chapters.xml", folder / "plain.mkv"})
+                      .code,
+                  0);
+        EXPECT_EQ(
+            Call(Join(Args{folder / "in.mkv", folder / "out.mkv", "-y", "--progress", "none"}, test.options))
+                .err,
+            test.told);
+        EXPECT_EQ(whole_movie::Probe(folder / "out.mkv")["chapters"].size(), test.options.empty() ? 2 : 0);
+        EXPECT_TRUE(Has(Call({folder / "in.mkv", folder / "out.avi", "-y"}).err,
+                        test.told.substr(0, test.told.find('\n'))));
+    }
+}
+
 /// One second with WebVTT beside the pictures, as Matroska's own programs write it: what tells a cue's place
 /// and its name stand beside it.
 void MakeWebVtt(const Folder& folder) {

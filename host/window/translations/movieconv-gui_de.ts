@@ -1253,6 +1253,14 @@
         <source>subtitles that appeared more than {:.0f} s before the begin and may still be shown there were not looked for</source>
         <translation>Untertitel, die mehr als {} s vor dem Beginn erschienen sind und dort noch zu sehen sein können, wurden nicht gesucht</translation>
     </message>
+    <message>
+        <source>the order in which they play parts of the movie is not followed</source>
+        <translation>der Reihenfolge, in der sie Teile des Films spielen, wird nicht gefolgt</translation>
+    </message>
+    <message>
+        <source>{} of them stand for parts of other files, which are not played</source>
+        <translation>{} davon stehen für Teile anderer Dateien, die nicht gespielt werden</translation>
+    </message>
 </context>
 <context>
     <name>LogShare</name>
