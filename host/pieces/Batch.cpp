@@ -95,8 +95,7 @@ std::string SettingsOf(Request request) {
 Sentence WhyNoMovie(Request request) {
     request.detectCrop = false; // which takes long and does not matter here
     try {
-        LookAtSource(request);
-        return {};
+        return LookAtSource(request).isImage ? Say("it is a single picture") : Sentence();
     } catch (const Failure& failure) {
         return failure.Words();
     }

@@ -53,6 +53,7 @@ Source::Source(const std::string& path, const SourceChoice& choice,
         info_.tags.push_back(std::move(tag));
     reader_.Select(std::move(selected));
     Probe();
+    info_.isImage = IsImage(*reader_.Context(), info_);
     if (info_.pictures)
         CropPictures(choice.crop);
 }

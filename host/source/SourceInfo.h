@@ -170,6 +170,7 @@ struct SourceInfo {
     std::optional<PictureStreamInfo> pictures; ///< The stream that is converted, probed.
     std::optional<SoundStreamInfo> sound;
     Promise promise;            ///< Of these two.
+    bool isImage = false;       ///< A file of one picture, as cameras and scanners write them.
     bool clockRestarts = false; ///< Its stamps are known not to tell places in it.
 };
 

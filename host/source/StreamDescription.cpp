@@ -350,6 +350,20 @@ std::vector<Chapter> DescribeChapters(const AVFormatContext& context, int64_t st
     return chapters;
 }
 
+bool IsImage(const AVFormatContext& context, const SourceInfo& info) {
+    if (!info.pictures || info.sound)
+        return false;
+    const std::string_view format = context.iformat->name;
+    constexpr std::string_view kPipe = "_pipe"; // FFmpeg's formats of one kind of image each end so
+    if (format == "image2" ||
+        (format.size() > kPipe.size() && format.substr(format.size() - kPipe.size()) == kPipe))
+        return true;
+    const std::string brand = TagOf(context.metadata, "major_brand");
+    const bool mayBe = format == "gif" || format == "apng" || brand == "avif" || brand == "heic";
+    constexpr double kLessThanTwo = 1.5; // pictures
+    return mayBe && info.pictures->duration * info.pictures->frameRate < kLessThanTwo;
+}
+
 std::vector<Tag> DescribeTags(const AVDictionary* metadata) {
     std::vector<Tag> tags;
     const AVDictionaryEntry* entry = nullptr;

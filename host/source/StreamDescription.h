@@ -20,6 +20,9 @@ std::vector<Chapter> DescribeChapters(const AVFormatContext& context, int64_t st
 /// Describes a stream as one of that codec.
 void SetCodec(StreamInfo& info, AVCodecID codec);
 
+/// SourceInfo::isImage, of a source that is known otherwise.
+bool IsImage(const AVFormatContext& context, const SourceInfo& info);
+
 /// What people wrote: nothing that a multiplexer notes about its own file.
 std::vector<Tag> DescribeTags(const AVDictionary* metadata);
 

@@ -228,6 +228,23 @@ TEST(ManyMovies, TakeNoNamesFromWhatIsNone) {
     EXPECT_EQ(result.code, 0) << result.err;
     EXPECT_TRUE(Has(result.err, "a.nfo\" is left out") && Has(result.err, "a.srt\" is left out"))
         << result.err;
+    // Photos beside the movies of a camera; an animation is none.
+    const auto photo = [&](const std::string& name, const char* pictures) {
+        test_movies::Ffmpeg(test_movies::Join(test_movies::Lavfi("testsrc=s=32x32:r=5:d=1"),
+                                              Args{"-frames:v", pictures, movies.folder / "in/" + name}));
+    };
+    for (const char* name : {"a.jpg", "b.png", "gif.gif"})
+        photo(name, "1");
+    photo("moves.gif", "5");
+    const Result photos = movies.Convert();
+    EXPECT_EQ(photos.code, 0) << photos.err;
+    for (const char* name : {"a.jpg", "b.png", "gif.gif"})
+        EXPECT_TRUE(Has(photos.err, std::string(name) + "\" is left out: it is a single picture"))
+            << photos.err;
+    EXPECT_TRUE(std::filesystem::exists(movies.out + "/moves.mp4"));
+    const Result named = Call({"--into", movies.out, movies.folder / "in/gif.gif"});
+    EXPECT_EQ(named.code, 0) << "it was asked for by its name: " << named.err;
+    EXPECT_TRUE(std::filesystem::exists(movies.out + "/gif.mp4"));
     WriteFile(movies.folder / "in/a.mka", ReadFile(Short()));
     const Result twice = movies.Convert();
     EXPECT_EQ(twice.code, 2);
