@@ -128,12 +128,17 @@ std::vector<Sentence> BesideTracks::Complaints() const {
                             ? Say("1 of its subtitles was not in UTF-8 and taken for Windows-1252")
                             : Say("{} of its subtitles were not in UTF-8 and taken for Windows-1252", cues));
     for (const BesideSound* sound : sounds_) {
-        if (sound->Damaged() > 0)
-            texts.push_back(Say("{} damaged pieces of sound data were skipped in stream {}", sound->Damaged(),
-                                sound->Stream()));
-        if (sound->Corrections() > 0)
-            texts.push_back(Say("the sound of stream {} had {} gaps or overlaps, which were closed",
-                                sound->Stream(), sound->Corrections()));
+        const int stream = sound->Stream();
+        if (const int64_t damaged = sound->Damaged(); damaged > 0)
+            texts.push_back(
+                damaged == 1
+                    ? Say("1 damaged piece of sound data was skipped in stream {}", stream)
+                    : Say("{} damaged pieces of sound data were skipped in stream {}", damaged, stream));
+        if (const int closed = sound->Corrections(); closed > 0)
+            texts.push_back(closed == 1
+                                ? Say("the sound of stream {} had 1 gap or overlap, which was closed", stream)
+                                : Say("the sound of stream {} had {} gaps or overlaps, which were closed",
+                                      stream, closed));
     }
     return texts;
 }

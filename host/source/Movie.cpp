@@ -157,16 +157,18 @@ std::vector<Sentence> Movie::Complaints() const {
         texts.push_back(jumps == 1 ? Say("the source's clock jumped once; the parts were joined")
                                    : Say("the source's clock jumped {} times; the parts were joined", jumps));
     }
-    if (pictures_ && pictures_->Damaged() > 0)
-        texts.push_back(Say("{} damaged pieces of picture data were skipped", pictures_->Damaged()));
-    if (pictures_ && pictures_->Repaired() > 0) {
-        texts.push_back(Say("{} pictures had a missing or falling time stamp", pictures_->Repaired()));
-    }
-    if (sound_ && sound_->Damaged() > 0)
-        texts.push_back(Say("{} damaged pieces of sound data were skipped", sound_->Damaged()));
-    if (sound_ && sound_->Corrections() > 0) {
-        texts.push_back(Say("the sound had {} gaps or overlaps, which were closed", sound_->Corrections()));
-    }
+    if (const int64_t damaged = pictures_ ? pictures_->Damaged() : 0; damaged > 0)
+        texts.push_back(damaged == 1 ? Say("1 damaged piece of picture data was skipped")
+                                     : Say("{} damaged pieces of picture data were skipped", damaged));
+    if (const int64_t repaired = pictures_ ? pictures_->Repaired() : 0; repaired > 0)
+        texts.push_back(repaired == 1 ? Say("1 picture had a missing or falling time stamp")
+                                      : Say("{} pictures had a missing or falling time stamp", repaired));
+    if (const int64_t damaged = sound_ ? sound_->Damaged() : 0; damaged > 0)
+        texts.push_back(damaged == 1 ? Say("1 damaged piece of sound data was skipped")
+                                     : Say("{} damaged pieces of sound data were skipped", damaged));
+    if (const int64_t closed = sound_ ? sound_->Corrections() : 0; closed > 0)
+        texts.push_back(closed == 1 ? Say("the sound had 1 gap or overlap, which was closed")
+                                    : Say("the sound had {} gaps or overlaps, which were closed", closed));
     if (sound_ && !beside_.Copies(Info().sound->index) && sound_->Channels() > Info().sound->channels)
         texts.push_back(
             Say("some of its sound has {} channels and got {}", sound_->Channels(), Info().sound->channels));

@@ -4,6 +4,7 @@
 #include "host/source/ConcatScript.h"
 #include "host/source/SourceError.h"
 
+#include <algorithm>
 #include <new>
 #include <system_error>
 
@@ -31,6 +32,18 @@ int WasInterrupted(void* interruption) {
 
 Sentence CannotOpen(const std::string& path, const Sentence& reason) {
     return Say("cannot open \"{}\": {}", path, reason);
+}
+
+/// Whether reading its head led so far beyond its first samples that nothing leads back to them.
+bool SamplesArePassed(const AVFormatContext& context) {
+    if (context.pb == nullptr || (context.pb->seekable & AVIO_SEEKABLE_NORMAL) != 0 ||
+        av_match_name("mov", context.iformat->name) == 0)
+        return false;
+    return std::any_of(context.streams, context.streams + context.nb_streams, [&](AVStream* stream) {
+        const AVIndexEntry* first = avformat_index_get_entry(stream, 0);
+        return first != nullptr && first->pos < avio_tell(context.pb) &&
+               avio_seek(context.pb, first->pos, SEEK_SET) < 0;
+    });
 }
 
 /// For want of memory too: how much is asked for is written in the file.
@@ -116,6 +129,8 @@ int MovieFile::TryToOpen(const std::string& url, const AVInputFormat& format, bo
     companions_.Guard(*context);
     const int result = avformat_open_input(&context, url.c_str(), &format, settings.Get());
     input_.reset(context);
+    if (result >= 0 && SamplesArePassed(*context))
+        throw SourceError(CannotOpen(path_, Say("its index is at its end, and a pipe cannot be sought")));
     return result < 0 ? result : avformat_find_stream_info(context, nullptr);
 }
 

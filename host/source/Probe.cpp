@@ -119,11 +119,16 @@ void FindPromise(const MovieReader& reader, const Length& length, SourceInfo& in
     if (!length.announced || (context.iformat->flags & AVFMT_TS_DISCONT) != 0 ||
         context.duration_estimation_method != AVFMT_DURATION_FROM_STREAM)
         return;
+    // Of one that is cut off FFmpeg lowers the length that its head tells by what there is of it.
+    const bool lowered = promise.cutOff && av_match_name("avi", context.iformat->name) != 0;
     // There each stream is given the length of the whole file.
     const bool oneLength = std::strcmp(context.iformat->name, "asf") == 0;
     const auto announced = [&](const auto& stream) -> std::optional<double> {
         if (!stream || oneLength)
             return std::nullopt;
+        const AVStream& told = *context.streams[stream->index];
+        if (lowered && told.nb_frames > 0)
+            return static_cast<double>(told.nb_frames) * av_q2d(told.time_base);
         // A stream that begins far behind the others is given the length of the file otherwise.
         const double tagged = TaggedEnd(context.streams[stream->index], ToSeconds(reader.Start()));
         const double end = tagged > 0 ? tagged : stream->duration;

@@ -241,4 +241,43 @@ TEST(BrokenMovie, WhatCannotBeDecodedToItsEndIsNoSuccess) {
     }
 }
 
+/// Most of its bytes belong to its first seconds, so that what is left of them does not tell what is missing.
+TEST(BrokenMovie, AviThatIsCutOffIsToldByTheLengthInItsHead) {
+    const Folder folder;
+    Ffmpeg(Join(Lavfi("nullsrc=s=64x48:r=10:d=20,geq=random(1)*255*lt(T\\,10):128:128"),
+                Words("-c:v mpeg4 -q:v 2"), Args{folder / "whole.avi"}));
+    const std::string whole = ReadFile(folder / "whole.avi");
+    WriteFile(folder / "cut.avi", whole.substr(0, whole.size() / 2));
+    const Result made = Call({folder / "cut.avi", folder / "out.mkv", "--progress", "none"});
+    EXPECT_EQ(made.code, 3);
+    EXPECT_NE(made.err.find("although it announces 0:00:20.000"), std::string::npos) << made.err;
+    EXPECT_NE(made.err.find(": 1 damaged piece of picture data was skipped"), std::string::npos) << made.err;
+}
+
+TEST(BrokenMovie, Mp4InAPipeIsToldToHaveItsIndexAtTheEnd) {
+    const Folder folder;
+    const struct {
+        const char* name;
+        Args options;
+        int code;
+    } cases[] = {{"end.mp4", {}, 0},             // all of it is kept
+                 {"long.mp4", {"-q:v", "1"}, 3}, // longer than what is kept of a pipe
+                 {"front.mp4", {"-movflags", "faststart"}, 0},
+                 {"fragments.mp4", {"-movflags", "frag_keyframe+empty_moov"}, 0}};
+    for (const auto& test : cases) {
+        SCOPED_TRACE(test.name);
+        const bool isLong = std::string(test.name) == "long.mp4";
+        Ffmpeg(Join(
+            Lavfi(isLong ? "testsrc=s=640x480:r=25:d=10,noise=alls=60:allf=t" : "testsrc=s=64x48:r=10:d=2"),
+            Words("-c:v mpeg4"), test.options, Args{folder / test.name}));
+        const Result made = program::Run({"sh", "-c", R"(cat "$1" | "$0" -y -q /dev/stdin "$2")",
+                                          MOVIECONV_PROGRAM, folder / test.name, folder / "out.mkv"});
+        EXPECT_EQ(made.code, test.code) << made.err;
+        EXPECT_EQ(made.err, test.code == 0
+                                ? ""
+                                : "movieconv: error: cannot open \"/dev/stdin\": its index is at its end, "
+                                  "and a pipe cannot be sought\n");
+    }
+}
+
 } // namespace

@@ -1261,6 +1261,34 @@
         <source>{} of them stand for parts of other files, which are not played</source>
         <translation>{} davon stehen für Teile anderer Dateien, die nicht gespielt werden</translation>
     </message>
+    <message>
+        <source>1 damaged piece of sound data was skipped in stream {}</source>
+        <translation>1 beschädigtes Stück der Tondaten in Spur {} wurde übersprungen</translation>
+    </message>
+    <message>
+        <source>the sound of stream {} had 1 gap or overlap, which was closed</source>
+        <translation>1 Lücke oder Überlappung im Ton von Spur {} wurde geschlossen</translation>
+    </message>
+    <message>
+        <source>1 damaged piece of picture data was skipped</source>
+        <translation>1 beschädigtes Stück der Bilddaten wurde übersprungen</translation>
+    </message>
+    <message>
+        <source>1 picture had a missing or falling time stamp</source>
+        <translation>1 Bild hatte keinen oder einen rückwärts laufenden Zeitstempel</translation>
+    </message>
+    <message>
+        <source>1 damaged piece of sound data was skipped</source>
+        <translation>1 beschädigtes Stück der Tondaten wurde übersprungen</translation>
+    </message>
+    <message>
+        <source>the sound had 1 gap or overlap, which was closed</source>
+        <translation>1 Lücke oder Überlappung im Ton wurde geschlossen</translation>
+    </message>
+    <message>
+        <source>its index is at its end, and a pipe cannot be sought</source>
+        <translation>sein Index steht am Ende, und in einer Pipe lässt sich nicht zurückspringen</translation>
+    </message>
 </context>
 <context>
     <name>LogShare</name>
