@@ -194,7 +194,7 @@ bool PictureDecoder::Deliver(StampRepair::Stamp stamp, bool isLast) {
     threads_.OnPicture(queue_.Size() == 0);
     for (PictureStay stay(whole, stamp); !refused_ && !stay.IsOver();) {
         const StampRepair::Stamp part = TakePart(stay, burner_);
-        av::Frame given = stay.IsOver() ? std::move(picture) : av::CopyOf(*picture);
+        av::Frame given = stay.IsOver() ? std::exchange(picture, nullptr) : av::CopyOf(*picture);
         if (burner_ != nullptr)
             burner_->Draw(*given, part.time);
         const std::size_t bytes = Bytes(*given);
