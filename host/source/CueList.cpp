@@ -124,11 +124,13 @@ av::CodecContext CueList::OpenDecoder(AVRational timeBase) const {
 
 std::vector<CueList::Span> CueList::Spans() const {
     std::vector<Span> spans;
+    spans.reserve(cues.size());
     int64_t next = std::numeric_limits<int64_t>::max(); // where the one behind those that begin together does
-    for (auto cue = cues.rbegin(); cue != cues.rend(); ++cue) {
-        if (!spans.empty() && spans.back().begin > cue->begin)
+    for (std::size_t i = cues.size(); i-- > 0;) {
+        const Cue& cue = cues[i];
+        if (!spans.empty() && spans.back().begin > cue.begin)
             next = spans.back().begin;
-        spans.push_back({cue->begin, cue->end > cue->begin ? cue->end : next});
+        spans.push_back({cue.begin, cue.end > cue.begin ? cue.end : next});
     }
     std::reverse(spans.begin(), spans.end());
     return spans;
