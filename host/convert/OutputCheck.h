@@ -28,7 +28,7 @@ std::map<int, std::string> ClipsOf(const std::string& output);
 std::optional<Warning> OlderClips(const std::string& output, int firstFree);
 
 /// What the conversion reads the file of that name as, "the source itself" or "a file of subtitles that is
-/// read"; null when it does not read it.
+/// read"; empty when it does not read it.
 Sentence WhatIsReadFrom(const std::string& path, const Request& request);
 
 /// Removes what an earlier run has left of `output`, which has its name but was not completed. A file that

@@ -145,14 +145,18 @@ double SamplesPerPacket(const Request& request, const FileFormatInfo& format, co
     return isAc3() ? 1536 : 1024; // other codecs have about as many
 }
 
+/// The converted sound and what goes along with it.
+double SoundTracks(const Request& request, const FileFormatInfo& format, const SourceInfo& source) {
+    return static_cast<double>(1 + CarryPlan(source, request, format).FurtherSound().size());
+}
+
 /// Packets a second of pictures and sound.
 double PacketRate(const Request& request, const FileFormatInfo& format, const SourceInfo& source,
                   double pictureRate) {
-    const auto tracks = static_cast<double>(1 + CarryPlan(source, request, format).FurtherSound().size());
     const bool pictures = source.pictures && format.bHasVideo != 0;
     const bool sound = source.sound && format.bHasAudio != 0;
     const double perTrack = sound ? source.sound->sampleRate / SamplesPerPacket(request, format, source) : 0;
-    return (pictures ? pictureRate : 0) + tracks * perTrack;
+    return (pictures ? pictureRate : 0) + SoundTracks(request, format, source) * perTrack;
 }
 
 /// What becomes of so many bytes a second in a format that cuts all into small packets.
@@ -184,7 +188,7 @@ Request FitIntoSize(Request request, const SourceInfo& source) {
     if (pictures && !QualityScaleOf(PictureCodecFor(request, format)))
         throw Failure(Category::kRequest, Say("a codec without a bit rate cannot keep below a size"));
     const bool packets = Has(format, kWriterFormatSmallPackets);
-    const auto tracks = static_cast<double>(1 + CarryPlan(source, request, format).FurtherSound().size());
+    const double tracks = SoundTracks(request, format, source);
     const double packetRate = PacketRate(request, format, source, pictures ? source.pictures->peakRate : 0);
     const int64_t room = *request.maxSize - StoredBytes(request, format, source);
     const double free = static_cast<double>(room) * 8 * (packets ? kPacketStreamShare : kShare) - kHeadBits -
