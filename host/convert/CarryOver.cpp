@@ -77,9 +77,9 @@ std::vector<NotCarried> LostCues(const std::vector<SubtitleTrack>& subtitles, ui
     std::vector<NotCarried> lost;
     for (const auto& [track, stream] : subtitles)
         if (const int64_t count = MWGetLostCues(writerSet, track); count > 0)
-            lost.push_back(LeftOf(stream, count == 1
-                                              ? Say("one of their texts could not be converted")
-                                              : Say("{} of their texts could not be converted", count)));
+            lost.push_back(
+                LeftOf(stream, SayCounted(count, Say("one of their texts could not be converted"),
+                                          Say("{} of their texts could not be converted", count))));
     return lost;
 }
 

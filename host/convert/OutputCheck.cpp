@@ -129,11 +129,11 @@ std::optional<Warning> OlderClips(const std::string& output, int firstFree) {
     const auto count = std::distance(first, clips.end());
     if (count == 0)
         return std::nullopt;
-    return Warning{Warning::Kind::kOlderClips,
-                   count == 1
-                       ? Say("\"{}\" of an earlier conversion stays beside the new clips", first->second)
-                       : Say("\"{}\" to \"{}\" of an earlier conversion stay beside the new clips",
-                             first->second, clips.rbegin()->second)};
+    return Warning{
+        Warning::Kind::kOlderClips,
+        SayCounted(count, Say("\"{}\" of an earlier conversion stays beside the new clips", first->second),
+                   Say("\"{}\" to \"{}\" of an earlier conversion stay beside the new clips", first->second,
+                       clips.rbegin()->second))};
 }
 
 Sentence WhatIsReadFrom(const std::string& path, const Request& request) {

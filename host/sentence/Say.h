@@ -5,6 +5,7 @@
 #include "host/sentence/Sentence.h"
 
 #include <cstddef>
+#include <cstdint>
 #include <fmt/format.h>
 #include <string>
 #include <string_view>
@@ -23,6 +24,9 @@ constexpr const char* Phrase(const char* text) {
 Sentence SayCodec(std::string name);
 Sentence SayAmount(std::string text);
 Sentence SayList(std::vector<Sentence> items);
+
+/// `one` for a single thing, `many` for several; empty for none, of which nothing is told.
+Sentence SayCounted(int64_t count, Sentence one, Sentence many);
 
 /// The place with that number, from 0, of those in a pattern: "{}" or, with how it is to be filled, "{:.1f}".
 std::string_view PlaceIn(std::string_view pattern, std::size_t number);

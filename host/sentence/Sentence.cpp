@@ -31,6 +31,10 @@ Sentence SayList(std::vector<Sentence> items) {
     return {Sentence::Kind::kList, std::move(text), std::move(items)};
 }
 
+Sentence SayCounted(int64_t count, Sentence one, Sentence many) {
+    return count <= 0 ? Sentence() : count == 1 ? std::move(one) : std::move(many);
+}
+
 std::string_view PlaceIn(std::string_view pattern, std::size_t number) {
     std::size_t begin = pattern.find('{');
     for (; number > 0; --number)

@@ -121,24 +121,23 @@ bool BesideTracks::Copies(int stream) const {
 
 std::vector<Sentence> BesideTracks::Complaints() const {
     std::vector<Sentence> texts;
-    if (Sentence unread = TellEarliestCue(earlierCues_.earliest, bounds_.begin); !unread.IsEmpty())
-        texts.push_back(std::move(unread));
-    if (const int64_t cues = cuesInOtherCharset_; cues > 0)
-        texts.push_back(cues == 1
-                            ? Say("1 of its subtitles was not in UTF-8 and taken for Windows-1252")
-                            : Say("{} of its subtitles were not in UTF-8 and taken for Windows-1252", cues));
+    const auto add = [&texts](Sentence text) {
+        if (!text.IsEmpty())
+            texts.push_back(std::move(text));
+    };
+    add(TellEarliestCue(earlierCues_.earliest, bounds_.begin));
+    const int64_t cues = cuesInOtherCharset_;
+    add(SayCounted(cues, Say("1 of its subtitles was not in UTF-8 and taken for Windows-1252"),
+                   Say("{} of its subtitles were not in UTF-8 and taken for Windows-1252", cues)));
     for (const BesideSound* sound : sounds_) {
         const int stream = sound->Stream();
-        if (const int64_t damaged = sound->Damaged(); damaged > 0)
-            texts.push_back(
-                damaged == 1
-                    ? Say("1 damaged piece of sound data was skipped in stream {}", stream)
-                    : Say("{} damaged pieces of sound data were skipped in stream {}", damaged, stream));
-        if (const int closed = sound->Corrections(); closed > 0)
-            texts.push_back(closed == 1
-                                ? Say("the sound of stream {} had 1 gap or overlap, which was closed", stream)
-                                : Say("the sound of stream {} had {} gaps or overlaps, which were closed",
-                                      stream, closed));
+        const int64_t damaged = sound->Damaged();
+        add(SayCounted(damaged, Say("1 damaged piece of sound data was skipped in stream {}", stream),
+                       Say("{} damaged pieces of sound data were skipped in stream {}", damaged, stream)));
+        const int closed = sound->Corrections();
+        add(SayCounted(
+            closed, Say("the sound of stream {} had 1 gap or overlap, which was closed", stream),
+            Say("the sound of stream {} had {} gaps or overlaps, which were closed", stream, closed)));
     }
     return texts;
 }

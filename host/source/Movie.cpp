@@ -30,6 +30,35 @@ Sentence TellLate(const LateStreams::Left& left) {
                      begin);
 }
 
+Sentence TellJumps(int jumps) {
+    return SayCounted(jumps, Say("the source's clock jumped once; the parts were joined"),
+                      Say("the source's clock jumped {} times; the parts were joined", jumps));
+}
+
+Sentence TellDamaged(const PictureDecoder& pictures) {
+    const int64_t damaged = pictures.Damaged();
+    return SayCounted(damaged, Say("1 damaged piece of picture data was skipped"),
+                      Say("{} damaged pieces of picture data were skipped", damaged));
+}
+
+Sentence TellRepaired(const PictureDecoder& pictures) {
+    const int64_t repaired = pictures.Repaired();
+    return SayCounted(repaired, Say("1 picture had a missing or falling time stamp"),
+                      Say("{} pictures had a missing or falling time stamp", repaired));
+}
+
+Sentence TellDamaged(const SoundDecoder& sound) {
+    const int64_t damaged = sound.Damaged();
+    return SayCounted(damaged, Say("1 damaged piece of sound data was skipped"),
+                      Say("{} damaged pieces of sound data were skipped", damaged));
+}
+
+Sentence TellClosed(const SoundDecoder& sound) {
+    const int64_t closed = sound.Corrections();
+    return SayCounted(closed, Say("the sound had 1 gap or overlap, which was closed"),
+                      Say("the sound had {} gaps or overlaps, which were closed", closed));
+}
+
 } // namespace
 
 Movie::Movie(const std::string& path, const SourceChoice& choice, std::shared_ptr<Interruption> interruption)
@@ -151,34 +180,27 @@ std::vector<Sentence> Movie::Losses() const {
 
 std::vector<Sentence> Movie::Complaints() const {
     std::vector<Sentence> texts;
-    for (const LateStreams::Left& left : demuxer_.LeftOut())
-        texts.push_back(TellLate(left));
-    if (const int jumps = demuxer_.ClockJumps(); jumps > 0) {
-        texts.push_back(jumps == 1 ? Say("the source's clock jumped once; the parts were joined")
-                                   : Say("the source's clock jumped {} times; the parts were joined", jumps));
-    }
-    if (const int64_t damaged = pictures_ ? pictures_->Damaged() : 0; damaged > 0)
-        texts.push_back(damaged == 1 ? Say("1 damaged piece of picture data was skipped")
-                                     : Say("{} damaged pieces of picture data were skipped", damaged));
-    if (const int64_t repaired = pictures_ ? pictures_->Repaired() : 0; repaired > 0)
-        texts.push_back(repaired == 1 ? Say("1 picture had a missing or falling time stamp")
-                                      : Say("{} pictures had a missing or falling time stamp", repaired));
-    if (const int64_t damaged = sound_ ? sound_->Damaged() : 0; damaged > 0)
-        texts.push_back(damaged == 1 ? Say("1 damaged piece of sound data was skipped")
-                                     : Say("{} damaged pieces of sound data were skipped", damaged));
-    if (const int64_t closed = sound_ ? sound_->Corrections() : 0; closed > 0)
-        texts.push_back(closed == 1 ? Say("the sound had 1 gap or overlap, which was closed")
-                                    : Say("the sound had {} gaps or overlaps, which were closed", closed));
-    if (sound_ && !beside_.Copies(Info().sound->index) && sound_->Channels() > Info().sound->channels)
-        texts.push_back(
-            Say("some of its sound has {} channels and got {}", sound_->Channels(), Info().sound->channels));
-    for (Sentence& text : beside_.Complaints())
-        texts.push_back(std::move(text));
-    const auto isNew = [&](const Sentence& text) {
-        return !text.IsEmpty() && std::find(texts.begin(), texts.end(), text) == texts.end();
+    const auto add = [&texts](Sentence text) {
+        if (!text.IsEmpty())
+            texts.push_back(std::move(text));
     };
-    if (burner_ && isNew(burner_->Unread()))
-        texts.push_back(burner_->Unread());
+    for (const LateStreams::Left& left : demuxer_.LeftOut())
+        add(TellLate(left));
+    add(TellJumps(demuxer_.ClockJumps()));
+    if (pictures_) {
+        add(TellDamaged(*pictures_));
+        add(TellRepaired(*pictures_));
+    }
+    if (sound_) {
+        add(TellDamaged(*sound_));
+        add(TellClosed(*sound_));
+    }
+    if (sound_ && !beside_.Copies(Info().sound->index) && sound_->Channels() > Info().sound->channels)
+        add(Say("some of its sound has {} channels and got {}", sound_->Channels(), Info().sound->channels));
+    for (Sentence& text : beside_.Complaints())
+        add(std::move(text));
+    if (burner_ && std::find(texts.begin(), texts.end(), burner_->Unread()) == texts.end())
+        add(burner_->Unread());
     return texts;
 }
 
