@@ -64,9 +64,7 @@ void ReadStream(CueList& list, const Source& source, const BurnWish& wish, bool 
     if (earliest > 0 && !source.Info().clockRestarts) {
         if (!wish.earliest)
             list.unread = TellEarliestCue(earliest, wish.begin);
-        const int64_t from = reader.Start() + earliest;
-        const int64_t target = av_rescale_q(from, {1, kTicksPerSecond}, av_get_time_base_q());
-        if (avformat_seek_file(context, -1, INT64_MIN, target, target, 0) < 0 && !reader.Rewind())
+        if (!SeekToCues(reader, earliest) && !reader.Rewind())
             throw TrackError(Say("the subtitles cannot be read ahead of the pictures"));
     }
     for (bool ended = false; !ended;) {

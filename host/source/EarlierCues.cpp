@@ -45,6 +45,14 @@ Sentence TellEarliestCue(int64_t earliest, int64_t begin) {
         ToSeconds(begin - earliest));
 }
 
+bool SeekToCues(MovieReader& file, int64_t earliest) {
+    if (earliest <= 0)
+        return true;
+    const int64_t from = file.Start() + earliest;
+    const int64_t target = av_rescale_q(from, {1, kTicksPerSecond}, av_get_time_base_q());
+    return avformat_seek_file(file.Context(), -1, INT64_MIN, target, target, 0) >= 0;
+}
+
 EarlierCues ReadEarlierCues(MovieReader& file, int main, std::vector<int> streams, int64_t begin) {
     EarlierCues found;
     if (!file.IsSeekable())
@@ -61,12 +69,8 @@ EarlierCues ReadEarlierCues(MovieReader& file, int main, std::vector<int> stream
     }
     AVFormatContext* context = file.Context();
     found.earliest = EarliestCueFor(file, begin);
-    if (found.earliest > 0) {
-        const int64_t from = file.Start() + found.earliest;
-        const int64_t target = av_rescale_q(from, {1, kTicksPerSecond}, av_get_time_base_q());
-        if (avformat_seek_file(context, -1, INT64_MIN, target, target, 0) < 0)
-            return found;
-    }
+    if (!SeekToCues(file, found.earliest))
+        return found;
     while (std::any_of(behind.begin(), behind.end(), [](const auto& stream) { return !stream.second; })) {
         av::Packet packet = av::NewPacket();
         const int result = av_read_frame(context, packet.get());

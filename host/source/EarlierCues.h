@@ -18,6 +18,10 @@ int64_t EarliestCueFor(const MovieReader& file, int64_t begin);
 /// Tells what was not looked for; empty where `earliest` is the source's start.
 Sentence TellEarliestCue(int64_t earliest, int64_t begin);
 
+/// Goes to where all that begins at `earliest` or later is still to be read; stays where it is for the source's
+/// start. False when the source cannot be sought there: where it is then is not known.
+bool SeekToCues(MovieReader& file, int64_t earliest);
+
 struct EarlierCues {
     std::map<int, std::vector<av::Packet>> packets; ///< By stream.
     int64_t earliest = 0;                           ///< See EarliestCueFor.
