@@ -2,9 +2,9 @@
 
 #include "engine/SourceFormat.h"
 #include "log/dyLog.h"
+#include "media/FileFormats.h"
 #include "media/FourCC.h"
 #include "media/Limits.h"
-#include "media/MediaWriter.h"
 #include "thread/SingleLock.h"
 
 #include <new>
@@ -36,18 +36,12 @@ EncodeParam DefaultEncodeParam() {
 
 /// Switches off what the file format cannot carry, by the media writer's table.
 void DropUnsupportedStreams(EncodeParam& param) {
-    const FileFormatInfo* entry = MWGetFileFormatInfos();
-    if (!entry)
-        return;
-    for (; entry->fccFormat != 0; ++entry) {
-        if (entry->fccFormat != param.fccFileFormat)
-            continue;
-        if (!entry->bHasVideo)
-            param.bNoVideo = 1;
-        if (!entry->bHasAudio)
-            param.bNoAudio = 1;
-        return;
-    }
+    const FileFormatInfo* format =
+        FindFileFormat([&](const FileFormatInfo& each) { return each.fccFormat == param.fccFileFormat; });
+    if (format && !format->bHasVideo)
+        param.bNoVideo = 1;
+    if (format && !format->bHasAudio)
+        param.bNoAudio = 1;
 }
 
 void CompleteFrom(const VideoFormat& source, EncodeParam& param) {

@@ -1,7 +1,7 @@
 #include "engine/FileParam.h"
 
+#include "media/FileFormats.h"
 #include "media/FourCC.h"
-#include "media/MediaWriter.h"
 
 #include <algorithm>
 #include <string_view>
@@ -11,37 +11,12 @@ namespace {
 constexpr int32_t kVideoBitrate = 4000000;
 constexpr int32_t kAudioBitrate = 160000;
 
-wchar_t Lower(wchar_t character) {
-    return character >= L'A' && character <= L'Z' ? character - L'A' + L'a' : character;
-}
-
 /// What follows the last dot of the file's own name.
 std::wstring_view Extension(std::wstring_view path) {
     const size_t dot = path.rfind(L'.');
     if (dot == std::wstring_view::npos || path.find(L'/', dot) != std::wstring_view::npos)
         return {};
     return path.substr(dot + 1);
-}
-
-/// Whether the comma-separated list names the extension.
-bool Lists(std::string_view list, std::wstring_view extension) {
-    while (!list.empty()) {
-        const std::string_view name = list.substr(0, list.find(','));
-        if (std::equal(name.begin(), name.end(), extension.begin(), extension.end(),
-                       [](char a, wchar_t b) { return Lower(static_cast<unsigned char>(a)) == Lower(b); }))
-            return true;
-        list.remove_prefix(std::min(name.size() + 1, list.size()));
-    }
-    return false;
-}
-
-const FileFormatInfo* FormatOf(std::wstring_view extension) {
-    if (extension.empty())
-        return nullptr;
-    for (const FileFormatInfo* entry = MWGetFileFormatInfos(); entry && entry->fccFormat != 0; ++entry)
-        if (Lists(entry->szExtensions, extension))
-            return entry;
-    return nullptr;
 }
 
 /// The usual codec where the format carries it, else the format's first; 0 when it carries none.
@@ -55,7 +30,9 @@ uint32_t Choose(const uint32_t (&carried)[32], uint32_t usual) {
 bool ParamForFile(const wchar_t* fileName, EncodeParam* param) {
     if (!fileName || !param)
         return false;
-    const FileFormatInfo* format = FormatOf(Extension(fileName));
+    const std::wstring_view extension = Extension(fileName);
+    const FileFormatInfo* format =
+        FindFileFormat([&](const FileFormatInfo& each) { return HasExtension(each, extension); });
     if (!format)
         return false;
     EncodeParam filled{};

@@ -4,8 +4,8 @@
 #include "host/convert/Failure.h"
 #include "host/convert/Formats.h"
 #include "host/sentence/Say.h"
+#include "media/FileFormats.h"
 #include "media/Limits.h"
-#include "media/MediaWriter.h"
 #include "writer/WriterStatus.h"
 
 #include <algorithm>
@@ -52,9 +52,9 @@ void RequireCopyable(const FileFormatInfo& format, const Request& request, const
     const std::string name = CodeName(format.fccFormat);
     if (MWCarriesPackets(format.fccFormat, sound.codec.c_str()) == 0) {
         std::string others;
-        for (const FileFormatInfo* other = MWGetFileFormatInfos(); other->fccFormat != 0; ++other)
-            if (MWCarriesPackets(other->fccFormat, sound.codec.c_str()) != 0)
-                others += (others.empty() ? "" : ", ") + CodeName(other->fccFormat);
+        for (const FileFormatInfo& other : FileFormats())
+            if (MWCarriesPackets(other.fccFormat, sound.codec.c_str()) != 0)
+                others += (others.empty() ? "" : ", ") + CodeName(other.fccFormat);
         throw Failure(
             Category::kRequest,
             others.empty()

@@ -1,8 +1,8 @@
 #include "host/convert/Formats.h"
 
 #include "media/CodeText.h"
+#include "media/FileFormats.h"
 #include "media/FourCC.h"
-#include "media/MediaWriter.h"
 #include "writer/WriterStatus.h"
 
 #include <algorithm>
@@ -13,27 +13,6 @@ namespace {
 
 char Lower(char c) {
     return static_cast<char>(std::tolower(static_cast<unsigned char>(c)));
-}
-
-bool HasExtension(const FileFormatInfo& format, std::string_view extension) {
-    std::string_view list = format.szExtensions;
-    for (;;) {
-        const std::size_t comma = list.find(',');
-        if (SameIgnoringCase(list.substr(0, comma), extension))
-            return true;
-        if (comma == std::string_view::npos)
-            return false;
-        list.remove_prefix(comma + 1);
-    }
-}
-
-template <class Matches>
-const FileFormatInfo* FindIf(Matches matches) {
-    for (const FileFormatInfo* format = MWGetFileFormatInfos(); format != nullptr && format->fccFormat != 0;
-         ++format)
-        if (matches(*format))
-            return format;
-    return nullptr;
 }
 
 } // namespace
@@ -50,7 +29,7 @@ std::string ShortName(const FileFormatInfo& format) {
 
 const FileFormatInfo* FindFormat(std::string_view name) {
     const std::optional<uint32_t> code = ParseCode(name);
-    return FindIf([&](const FileFormatInfo& format) {
+    return FindFileFormat([&](const FileFormatInfo& format) {
         return (code && format.fccFormat == *code) || HasExtension(format, name);
     });
 }
@@ -60,7 +39,8 @@ const FileFormatInfo* FindFormatOfFile(std::string_view path) {
     const std::size_t dot = name.rfind('.');
     if (dot == std::string_view::npos)
         return nullptr;
-    return FindIf([&](const FileFormatInfo& format) { return HasExtension(format, name.substr(dot + 1)); });
+    return FindFileFormat(
+        [&](const FileFormatInfo& format) { return HasExtension(format, name.substr(dot + 1)); });
 }
 
 bool Has(const FileFormatInfo& format, uint32_t trait) {

@@ -3,7 +3,7 @@
 #include "host/convert/Formats.h"
 #include "host/presets/Preset.h"
 #include "host/terminal/JsonLine.h"
-#include "media/MediaWriter.h"
+#include "media/FileFormats.h"
 #include "text/Printable.h"
 
 #include <algorithm>
@@ -17,22 +17,9 @@ namespace {
 
 using Json = nlohmann::ordered_json;
 
-/// Calls `take` with each file format.
-template <class Take>
-void ForEachFormat(Take take) {
-    for (const FileFormatInfo* format = MWGetFileFormatInfos(); format != nullptr && format->fccFormat != 0;
-         ++format)
-        take(*format);
-}
-
 std::vector<std::string> Extensions(const FileFormatInfo& format) {
-    std::vector<std::string> names{""};
-    for (const char c : std::string(format.szExtensions)) {
-        if (c == ',')
-            names.emplace_back();
-        else
-            names.back() += c;
-    }
+    std::vector<std::string> names;
+    ForEachExtension(format, [&](std::string_view name) { names.emplace_back(name); });
     return names;
 }
 
@@ -52,7 +39,7 @@ std::vector<std::string> Codecs(const uint32_t (&codes)[N]) {
 
 std::string FormatsText() {
     std::string text;
-    ForEachFormat([&](const FileFormatInfo& format) {
+    for (const FileFormatInfo& format : FileFormats()) {
         const auto add = [&](const char* title, const std::vector<std::string>& codecs) {
             if (!codecs.empty())
                 fmt::format_to(std::back_inserter(text), "      {:<9} {}\n", title, fmt::join(codecs, ", "));
@@ -61,19 +48,19 @@ std::string FormatsText() {
                        format.szName, fmt::join(Extensions(format), ", ."));
         add("pictures:", Codecs(format.fccVideoCodecs));
         add("sound:", Codecs(format.fccAudioCodecs));
-    });
+    }
     return text;
 }
 
 std::string FormatsJson() {
     Json list = Json::array();
-    ForEachFormat([&](const FileFormatInfo& format) {
+    for (const FileFormatInfo& format : FileFormats()) {
         list.push_back({{"code", CodeName(format.fccFormat)},
                         {"name", format.szName},
                         {"extensions", Extensions(format)},
                         {"pictures", Codecs(format.fccVideoCodecs)},
                         {"sound", Codecs(format.fccAudioCodecs)}});
-    });
+    }
     return JsonLine("formats", {{"formats", list}});
 }
 
@@ -110,20 +97,20 @@ std::string PresetNames() {
 
 std::vector<std::string> ExtensionNames() {
     std::vector<std::string> names;
-    ForEachFormat([&](const FileFormatInfo& format) {
+    for (const FileFormatInfo& format : FileFormats()) {
         const std::vector<std::string> own = Extensions(format);
         names.insert(names.end(), own.begin(), own.end());
-    });
+    }
     return names;
 }
 
 std::vector<std::string> CodecNames(bool forSound) {
     std::vector<std::string> names;
-    ForEachFormat([&](const FileFormatInfo& format) {
+    for (const FileFormatInfo& format : FileFormats()) {
         const std::vector<std::string> own =
             forSound ? Codecs(format.fccAudioCodecs) : Codecs(format.fccVideoCodecs);
         names.insert(names.end(), own.begin(), own.end());
-    });
+    }
     std::sort(names.begin(), names.end());
     names.erase(std::unique(names.begin(), names.end()), names.end());
     return names;
