@@ -190,6 +190,7 @@ Verdict JoinPieces(const Plan& plan, const std::string& planPath, const JoinOrde
     CheckPieces(plan, planPath, bell, follow);
     Request reading = request;
     reading.piece.emplace().pictures = false;
+    reading.burnSubtitles.clear(); // the pieces' pictures have them
     Movie movie = OpenMovie(reading);
     WriterWatch watch(request, movie.Info(), bell);
     FileLedger files(observer);
