@@ -27,8 +27,11 @@ public:
 
     MuxedStream Stream() const override {
         const AVCodecContext& encoder = stage_.Encoder();
-        return {parameters_.get(), {1, encoder.sample_rate}, {0, 1}, {0, 1}, encoder.initial_padding,
-                &carriage_,        &plan_.track->label};
+        return {.parameters = parameters_.get(),
+                .unit = {1, encoder.sample_rate},
+                .runUp = encoder.initial_padding,
+                .carriage = &carriage_,
+                .label = &plan_.track->label};
     }
 
     void Start(PacketTaker take, StageFailure failed) override {

@@ -77,19 +77,16 @@ bool AddTrack(Extras& extras, const WriterTrack* track) {
     const bool isSound = track->nSampleRate > 0 && track->nChannels > 0 && track->nBitsPerSample > 0;
     if (isSound == (track->pParameters != nullptr))
         return false;
-    Track made{{},
-               track->nSampleRate,
-               track->nChannels,
-               track->nBitsPerSample,
-               track->nBitrate,
-               track->nSize < sizeof *track ? 0 : track->nChannelMask,
-               {},
-               track->pfnNext,
-               track->pContext,
-               std::make_shared<std::atomic<int64_t>>(0)};
-    if (!isSound) {
-        made.parameters = av::CopyOf(*track->pParameters);
-    }
+    Track made{.label = {},
+               .sampleRate = track->nSampleRate,
+               .channels = track->nChannels,
+               .bitsPerSample = track->nBitsPerSample,
+               .bitrate = track->nBitrate,
+               .speakers = track->nSize < sizeof *track ? 0 : track->nChannelMask,
+               .parameters = isSound ? nullptr : av::CopyOf(*track->pParameters),
+               .next = track->pfnNext,
+               .context = track->pContext,
+               .lostCues = std::make_shared<std::atomic<int64_t>>(0)};
     extras.tracks.push_back(std::move(made));
     return true;
 }

@@ -54,10 +54,9 @@ void FileFinisher::TellLengths() {
 /// unless something comes with the index alone.
 void FileFinisher::FinishInPlace() {
     try {
-        FinishFragments(part_.File(), part_.Streams(), *plan_.container, part_.Fragments(), *part_.Room(),
-                        plan_.bitExact, extras_, [this](double share) {
-                            Progress(kDrainedShare + (kIndexedShare - kDrainedShare) * share);
-                        });
+        FinishFragments(part_, plan_, extras_, [this](double share) {
+            Progress(kDrainedShare + (kIndexedShare - kDrainedShare) * share);
+        });
         isPlain_ = true;
     } catch (const SyncFailure&) {
         throw;

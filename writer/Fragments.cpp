@@ -1,6 +1,8 @@
 #include "writer/Fragments.h"
 
 #include "ffmpeg/Mp4Box.h"
+#include "writer/Mp4Index.h"
+#include "writer/PartFile.h"
 #include "writer/TextRows.h"
 #include "writer/WriterFailure.h"
 #include "writer/WriterStatus.h"
@@ -184,19 +186,21 @@ void CheckIndex(ByteFile& file, const PacketWriter& written) {
 
 } // namespace
 
-void FinishFragments(const std::shared_ptr<ByteFile>& part, const PacketWriter& written,
-                     const Container& container, const FragmentLog& log, const Mp4Room& room, bool bitExact,
-                     const Extras& extras, const std::function<void(double)>& progress) {
+void FinishFragments(const PartFile& part, const FilePlan& plan, const Extras& extras,
+                     const std::function<void(double)>& progress) {
+    const std::shared_ptr<ByteFile>& bytes = part.File();
+    const PacketWriter& written = part.Streams();
+    const FragmentLog& log = part.Fragments();
     // The multiplexer does not tell of data that it had no memory for.
-    const int64_t end = part->Seek(0, SEEK_END);
+    const int64_t end = bytes->Seek(0, SEEK_END);
     if (log.End() != end)
         ThrowIncomplete();
-    AvioFile file(part, AvioFile::Mode::kRead);
+    AvioFile file(bytes, AvioFile::Mode::kRead);
     const av::Input input = OpenMovie(file, kWriterErrorFinish, AVFMT_FLAG_IGNIDX);
     if (static_cast<int>(input->nb_streams) != written.StreamCount())
         ThrowIncomplete();
     const auto makeIndex = [&](int64_t place) {
-        Mp4Index index(container, bitExact, extras, place);
+        Mp4Index index(*plan.container, plan.bitExact, extras, place);
         AddStreams(*input, written, index);
         const TextRows texts = AddTexts(log, written, end, index);
         ForEachPacket(log, written, [&](const PlacedPacket& packet) {
@@ -205,7 +209,8 @@ void FinishFragments(const std::shared_ptr<ByteFile>& part, const PacketWriter& 
             if (packet.position + packet.size > end)
                 ThrowIncomplete();
             progress(static_cast<double>(packet.position) / static_cast<double>(end));
-            index.Add(packet, index.WantsContent(packet) ? ReadStart(*part, packet) : std::vector<uint8_t>{});
+            index.Add(packet,
+                      index.WantsContent(packet) ? ReadStart(*bytes, packet) : std::vector<uint8_t>{});
         });
         for (int stream = 0; stream < written.StreamCount(); ++stream)
             if ((IsText(written, stream) ? texts.Texts(stream) : index.Packets(stream)) !=
@@ -213,8 +218,8 @@ void FinishFragments(const std::shared_ptr<ByteFile>& part, const PacketWriter& 
                 ThrowIncomplete();
         return index.Finish();
     };
-    room.Finish(*part, makeIndex, Mp4Index::MostTexts(extras),
-                [&written](ByteFile& plain) { CheckIndex(plain, written); });
+    part.Room()->Finish(*bytes, makeIndex, Mp4Index::MostTexts(extras),
+                        [&written](ByteFile& plain) { CheckIndex(plain, written); });
 }
 
 int64_t WholeFragments(ByteFile& part, int64_t size) {

@@ -45,14 +45,14 @@ EncoderFlags FlagsFor(const FilePlan& plan) {
     return {format != nullptr && (format->flags & AVFMT_GLOBALHEADER) != 0, plan.bitExact};
 }
 
-int AddEncoder(PacketWriter& file, const AVCodecContext& context, AVRational unit, AVRational rate,
-               int64_t runUp, const Carriage& carriage, const TrackLabel& label,
-               const HdrLight* light = nullptr) {
+/// `stream` without what the encoder itself tells.
+int AddEncoder(PacketWriter& file, const AVCodecContext& encoder, MuxedStream stream) {
     const av::CodecParameters parameters = av::NewParameters();
-    if (avcodec_parameters_from_context(parameters.get(), &context) < 0)
+    if (avcodec_parameters_from_context(parameters.get(), &encoder) < 0)
         throw std::bad_alloc();
-    return file.AddStream(
-        {parameters.get(), unit, rate, context.sample_aspect_ratio, runUp, &carriage, &label, light});
+    stream.parameters = parameters.get();
+    stream.sampleAspect = encoder.sample_aspect_ratio;
+    return file.AddStream(stream);
 }
 
 } // namespace
@@ -85,17 +85,22 @@ void MediaFile::OpenStages() {
         const AVCodecContext& encoder = pictures_->Encoder();
         const PictureClock& clock = plan_.pictures->clock;
         pictureStream_ = AddEncoder(
-            part_.Streams(), encoder, clock.tick, clock.rate,
-            int64_t{encoder.has_b_frames} * clock.ticksPerPicture,
-            FindCarriage(*plan_.container, plan_.pictures->codec->code), record_->ExtraParts()->pictures,
-            plan_.pictures->settings.light ? &*plan_.pictures->settings.light : nullptr);
+            part_.Streams(), encoder,
+            {.unit = clock.tick,
+             .rate = clock.rate,
+             .runUp = int64_t{encoder.has_b_frames} * clock.ticksPerPicture,
+             .carriage = &FindCarriage(*plan_.container, plan_.pictures->codec->code),
+             .label = &record_->ExtraParts()->pictures,
+             .light = plan_.pictures->settings.light ? &*plan_.pictures->settings.light : nullptr});
     }
     if (plan_.sound) {
         sound_ = std::make_unique<SoundStage>(*plan_.sound, flags);
         const AVCodecContext& encoder = sound_->Encoder();
-        soundStream_ = AddEncoder(
-            part_.Streams(), encoder, {1, encoder.sample_rate}, {0, 1}, encoder.initial_padding,
-            FindCarriage(*plan_.container, plan_.sound->codec->code), record_->ExtraParts()->sound);
+        soundStream_ = AddEncoder(part_.Streams(), encoder,
+                                  {.unit = {1, encoder.sample_rate},
+                                   .runUp = encoder.initial_padding,
+                                   .carriage = &FindCarriage(*plan_.container, plan_.sound->codec->code),
+                                   .label = &record_->ExtraParts()->sound});
     }
     for (const TrackPlan& track : plan_.tracks)
         beside_.Add(track, *plan_.container, flags, record_->Sequence() == 1, part_.Streams());

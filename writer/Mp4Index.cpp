@@ -91,7 +91,7 @@ Mp4Index::Mp4Index(const Container& container, bool bitExact, const Extras& extr
       place_(place),
       sink_(std::make_shared<Sink>()),
       file_(sink_, AvioFile::Mode::kWrite),
-      muxer_(container, file_, false, bitExact, extras),
+      muxer_(container, file_, {.fragmented = false, .bitExact = bitExact}, extras),
       packet_(av::NewPacket()) {
     file_.Io()->direct = 1; // what stands in for the data need not be copied
 }

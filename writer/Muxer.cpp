@@ -66,11 +66,11 @@ void SetFragments(AVFormatContext& output, bool describedByPacket, int64_t room)
 
 } // namespace
 
-Muxer::Muxer(const Container& container, AvioFile& file, bool fragmented, bool bitExact, const Extras& extras)
+Muxer::Muxer(const Container& container, AvioFile& file, Form form, const Extras& extras)
     : container_(container),
       file_(file),
-      fragmented_(fragmented),
-      extras_(container, fragmented, extras),
+      fragmented_(form.fragmented),
+      extras_(container, form.fragmented, extras),
       packet_(av::NewPacket()) {
     AVFormatContext* output = nullptr;
     const int error = avformat_alloc_output_context2(&output, nullptr, container.muxer, nullptr);
@@ -78,7 +78,7 @@ Muxer::Muxer(const Container& container, AvioFile& file, bool fragmented, bool b
     Check(error, "cannot be made");
     output_->pb = file.Io();
     output_->flags |= AVFMT_FLAG_CUSTOM_IO;
-    if (bitExact)
+    if (form.bitExact)
         output_->flags |= AVFMT_FLAG_BITEXACT;
     extras_.SetMovieTags(*output_);
 }
@@ -305,13 +305,19 @@ Muxer::Written Muxer::Stream(int stream) const {
     const AVStream* out = output_->streams[stream];
     const int64_t length = state.endPts - state.firstPts - out->codecpar->initial_padding;
     const int64_t runUp = av_rescale_q(state.runUp, state.unit, out->time_base);
-    return {{out->codecpar, out->time_base, out->avg_frame_rate, out->sample_aspect_ratio, runUp,
-             state.carriage, state.label, state.light},
-            state.delay,
-            state.packets,
-            av_rescale_q(state.endPts, state.unit, out->time_base),
-            av_rescale_q(state.lastPts, state.unit, out->time_base),
-            static_cast<double>(std::max<int64_t>(0, length)) * av_q2d(state.unit)};
+    return {.description = {.parameters = out->codecpar,
+                            .unit = out->time_base,
+                            .rate = out->avg_frame_rate,
+                            .sampleAspect = out->sample_aspect_ratio,
+                            .runUp = runUp,
+                            .carriage = state.carriage,
+                            .label = state.label,
+                            .light = state.light},
+            .delay = state.delay,
+            .packets = state.packets,
+            .end = av_rescale_q(state.endPts, state.unit, out->time_base),
+            .last = av_rescale_q(state.lastPts, state.unit, out->time_base),
+            .seconds = static_cast<double>(std::max<int64_t>(0, length)) * av_q2d(state.unit)};
 }
 
 bool Muxer::Empty() const {

@@ -21,12 +21,17 @@ namespace writer {
 /// Streams are added, the header is written, then packets come from any thread, then the end.
 class Muxer final : public PacketWriter {
 public:
-    /// `fragmented`: the file can be played up to wherever it ends, at the price of an index spread all over
-    /// it. All functions throw WriterFailure (kWriterErrorEncode) or std::bad_alloc; where `file` has failed,
-    /// its error is the real reason.
+    struct Form {
+        /// It can be played up to wherever it ends, at the price of an index spread all over it.
+        bool fragmented;
+        bool bitExact; ///< Nothing in it tells time, date or library version.
+    };
+
     /// The file gets what the container carries of `extras`, read as long as the muxer lives: tags with the
-    /// header, cover and attachments too where it is not fragmented, chapters by SetChapters.
-    Muxer(const Container& container, AvioFile& file, bool fragmented, bool bitExact, const Extras& extras);
+    /// header, cover and attachments too where it is not fragmented, chapters by SetChapters. All functions
+    /// throw WriterFailure (kWriterErrorEncode) or std::bad_alloc; where `file` has failed, its error is the
+    /// real reason.
+    Muxer(const Container& container, AvioFile& file, Form form, const Extras& extras);
 
     /// Returns the stream's number, from 0 on. A fragmented file cannot express times below 0: all its times
     /// are later by the longest run-up.

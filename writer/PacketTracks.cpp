@@ -44,7 +44,8 @@ public:
         : track_(track), unit_(unit), parameters_(av::NewParameters()) {}
 
     MuxedStream Stream() const override {
-        return {parameters_.get(), unit_, {0, 1}, {0, 1}, 0, &kAsUsual, &track_.label};
+        return {
+            .parameters = parameters_.get(), .unit = unit_, .carriage = &kAsUsual, .label = &track_.label};
     }
     void Start(PacketTaker take, StageFailure /*failed*/) override { take_ = std::move(take); }
     void Finish() override {}
@@ -145,8 +146,11 @@ public:
     }
 
     MuxedStream Stream() const override {
-        return {parameters_.get(), unit_,        {0, 1}, {0, 1}, parameters_->initial_padding,
-                &carriage_,        &track_.label};
+        return {.parameters = parameters_.get(),
+                .unit = unit_,
+                .runUp = parameters_->initial_padding,
+                .carriage = &carriage_,
+                .label = &track_.label};
     }
 
     bool Take(const WriterTrackItem& item, int64_t time) override {

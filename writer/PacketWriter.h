@@ -14,14 +14,14 @@ namespace writer {
 
 /// One stream as it enters a muxer.
 struct MuxedStream {
-    const AVCodecParameters* parameters; ///< Read during AddStream only.
-    AVRational unit;                     ///< Unit of the packets' times, in seconds.
-    AVRational rate;                     ///< Pictures per second; 0/1 for sound.
-    AVRational sampleAspect;             ///< Shape of the pixels; 0/1 for sound.
-    int64_t runUp;                       ///< How far below 0 times can begin, in the unit.
-    const Carriage* carriage;            ///< How the container carries its codec.
-    const TrackLabel* label;             ///< What is said about it; lives as long as the writer.
-    const HdrLight* light = nullptr;     ///< Of HDR pictures, which lives as long as the writer; may be null.
+    const AVCodecParameters* parameters = nullptr; ///< Read during AddStream only.
+    AVRational unit{0, 1};                         ///< Unit of the packets' times, in seconds.
+    AVRational rate{0, 1};                         ///< Pictures per second; 0/1 for all else.
+    AVRational sampleAspect{0, 1};                 ///< Shape of the pixels; 0/1 for all else.
+    int64_t runUp = 0;                             ///< How far below 0 times can begin, in the unit.
+    const Carriage* carriage = nullptr;            ///< How the container carries its codec.
+    const TrackLabel* label = nullptr;             ///< What is said about it; lives as long as the writer.
+    const HdrLight* light = nullptr; ///< Of HDR pictures, which lives as long as the writer; may be null.
 };
 
 /// Streams are added, the header is written, then packets come from any thread, then the end. All functions

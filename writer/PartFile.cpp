@@ -47,8 +47,10 @@ PartFile::PartFile(const std::string& target, const FilePlan& plan, std::shared_
         if (plan.piece != kWriterPieceNone)
             packets_ = std::make_unique<PieceWriter>(*io_, *record_);
         else
-            packets_ = std::make_unique<Muxer>(*plan.container, *io_, plan.Fragmented(), plan.bitExact,
-                                               *record_->ExtraParts());
+            packets_ = std::make_unique<Muxer>(
+                *plan.container, *io_,
+                Muxer::Form{.fragmented = plan.Fragmented(), .bitExact = plan.bitExact},
+                *record_->ExtraParts());
     } catch (...) {
         files_.Remove(path_);
         throw;

@@ -218,12 +218,12 @@ PacketWriter::Written PieceWriter::Stream(int stream) const {
     const State& state = streams_[static_cast<std::size_t>(stream)];
     const int64_t length =
         state.packets > 0 ? state.end - state.begin - state.parameters->initial_padding : 0;
-    return {state.description,
-            0,
-            state.packets,
-            state.end,
-            state.last,
-            static_cast<double>(std::max<int64_t>(0, length)) * av_q2d(state.description.unit)};
+    return {.description = state.description,
+            .delay = 0,
+            .packets = state.packets,
+            .end = state.end,
+            .last = state.last,
+            .seconds = static_cast<double>(std::max<int64_t>(0, length)) * av_q2d(state.description.unit)};
 }
 
 bool PieceWriter::Empty() const {
@@ -286,13 +286,13 @@ PieceReader::Description PieceReader::ReadDescription(const uint8_t* data, std::
 
 MuxedStream PieceReader::Stream(int stream, const Container& container, const TrackLabel& label) const {
     const Description& found = streams_.at(static_cast<std::size_t>(stream));
-    return {found.parameters.get(),
-            found.unit,
-            found.rate,
-            found.sampleAspect,
-            found.runUp,
-            &FindCarriage(container, found.codec),
-            &label};
+    return {.parameters = found.parameters.get(),
+            .unit = found.unit,
+            .rate = found.rate,
+            .sampleAspect = found.sampleAspect,
+            .runUp = found.runUp,
+            .carriage = &FindCarriage(container, found.codec),
+            .label = &label};
 }
 
 bool PieceReader::Read(AVPacket& packet, int only) {

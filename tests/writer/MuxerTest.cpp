@@ -54,7 +54,8 @@ private:
 class SoundFile {
 public:
     SoundFile(const char (&format)[5], AVCodecID codec)
-        : muxer_(*writer::FindContainer(FourCC(format)), io_, false, true, extras_) {
+        : muxer_(*writer::FindContainer(FourCC(format)), io_, {.fragmented = false, .bitExact = true},
+                 extras_) {
         const av::CodecParameters parameters = av::NewParameters();
         parameters->codec_type = AVMEDIA_TYPE_AUDIO;
         parameters->codec_id = codec;
@@ -66,7 +67,8 @@ public:
         av_channel_layout_copy(&parameters->ch_layout, mono.Get());
         static constexpr writer::Carriage kUsual;
         static const writer::TrackLabel kUnnamed;
-        muxer_.AddStream({parameters.get(), {1, 48000}, {0, 1}, {0, 1}, 0, &kUsual, &kUnnamed});
+        muxer_.AddStream(
+            {.parameters = parameters.get(), .unit = {1, 48000}, .carriage = &kUsual, .label = &kUnnamed});
         muxer_.WriteHeader(0);
     }
 
