@@ -135,35 +135,35 @@ bool IsBt601(AVColorSpace matrix) {
 /// How large the pictures are, of what shape, and in which form the encoder gets them.
 void SetShape(PicturePlan& plan, const EncodeParam& param, const VideoFormat& source,
               const WriterOptions& options) {
-    plan.sourceAspect = {options.nSampleAspectNum, options.nSampleAspectDen};
-    if (plan.sourceAspect.num <= 0 || plan.sourceAspect.den <= 0)
-        plan.sourceAspect = {1, 1};
-    plan.stretch = param.bResize != 0;
+    plan.scaling.sourceAspect = {options.nSampleAspectNum, options.nSampleAspectDen};
+    if (plan.scaling.sourceAspect.num <= 0 || plan.scaling.sourceAspect.den <= 0)
+        plan.scaling.sourceAspect = {1, 1};
+    plan.scaling.stretch = param.bResize != 0;
     plan.toPalette = plan.codec->format == AV_PIX_FMT_PAL8;
     const int width = plan.settings.width;
     const int height = plan.settings.height;
     if (source.nWidth > 0 && source.nHeight > 0)
-        plan.settings.sampleAspect =
-            FitPicture(source.nWidth, source.nHeight, plan.sourceAspect, width, height, plan.stretch)
-                .sampleAspect;
-    plan.picture.width = width;
-    plan.picture.height = height;
-    plan.picture.format = plan.toPalette ? kPaletteSource : plan.settings.format;
+        plan.settings.sampleAspect = FitPicture(source.nWidth, source.nHeight, plan.scaling.sourceAspect,
+                                                width, height, plan.scaling.stretch)
+                                         .sampleAspect;
+    plan.scaling.width = width;
+    plan.scaling.height = height;
+    plan.scaling.format = plan.toPalette ? kPaletteSource : plan.settings.format;
     if (plan.codec->evenSize) {
-        plan.picture.padWidth = width % 2;
-        plan.picture.padHeight = height % 2;
-        plan.settings.width += plan.picture.padWidth;
-        plan.settings.height += plan.picture.padHeight;
+        plan.scaling.padWidth = width % 2;
+        plan.scaling.padHeight = height % 2;
+        plan.settings.width += plan.scaling.padWidth;
+        plan.settings.height += plan.scaling.padHeight;
     }
 }
 
 void SetColours(PicturePlan& plan, const Carriage& carriage, const WriterOptions& options) {
-    plan.sourceFullRange = options.bFullRange != 0;
-    plan.picture.fullRange = plan.sourceFullRange || plan.codec->format == AV_PIX_FMT_YUVJ420P;
-    plan.settings.fullRange = plan.picture.fullRange;
-    plan.picture.matrix = plan.picture.sourceMatrix = plan.settings.matrix;
+    plan.scaling.sourceFullRange = options.bFullRange != 0;
+    plan.scaling.fullRange = plan.scaling.sourceFullRange || plan.codec->format == AV_PIX_FMT_YUVJ420P;
+    plan.settings.fullRange = plan.scaling.fullRange;
+    plan.scaling.matrix = plan.scaling.sourceMatrix = plan.settings.matrix;
     if ((plan.codec->isBt601 || carriage.isBt601) && !IsBt601(plan.settings.matrix)) {
-        plan.picture.matrix = SWS_CS_ITU601;
+        plan.scaling.matrix = SWS_CS_ITU601;
         plan.settings.matrix = AVCOL_SPC_BT470BG;
     }
 }

@@ -22,11 +22,8 @@ namespace writer {
 struct PicturePlan {
     const PictureCodec* codec;
     PictureSettings settings;
-    PictureScaler::Output picture;
-    bool toPalette;          ///< The encoder gets at most 256 colours a picture, chosen for each.
-    AVRational sourceAspect; ///< Shape of the source's pixels.
-    bool sourceFullRange;
-    bool stretch;
+    PictureScaler::Settings scaling;
+    bool toPalette; ///< The encoder gets at most 256 colours a picture, chosen for each.
     PictureClock clock;
     bool keepStamps;       ///< Every picture is shown once at its own time; otherwise a steady rate is made.
     int64_t pictureLength; ///< Usual length of a source picture in 100 ns units.

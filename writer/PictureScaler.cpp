@@ -129,30 +129,28 @@ av::Frame FramePool::Get(AVPixelFormat format, int width, int height) {
     return frame;
 }
 
-PictureScaler::PictureScaler(const Output& output, AVRational sampleAspect, bool stretch,
-                             bool sourceFullRange)
-    : output_(output), sampleAspect_(sampleAspect), stretch_(stretch), sourceFullRange_(sourceFullRange) {}
-
 av::Frame PictureScaler::Convert(av::Frame picture) {
-    const bool padded = output_.padWidth > 0 || output_.padHeight > 0;
-    const bool sameFormat = picture->format == output_.format && sourceFullRange_ == output_.fullRange &&
-                            output_.sourceMatrix == output_.matrix;
-    if (sameFormat && !padded && picture->width == output_.width && picture->height == output_.height)
+    const bool padded = settings_.padWidth > 0 || settings_.padHeight > 0;
+    const bool sameFormat = picture->format == settings_.format &&
+                            settings_.sourceFullRange == settings_.fullRange &&
+                            settings_.sourceMatrix == settings_.matrix;
+    if (sameFormat && !padded && picture->width == settings_.width && picture->height == settings_.height)
         return picture;
     PrepareFor(*picture);
-    av::Frame frame =
-        pool_.Get(output_.format, output_.width + output_.padWidth, output_.height + output_.padHeight);
+    av::Frame frame = pool_.Get(settings_.format, settings_.width + settings_.padWidth,
+                                settings_.height + settings_.padHeight);
     av_frame_copy_props(frame.get(), picture.get());
     if (fit_.fittedWidth == fit_.width && fit_.fittedHeight == fit_.height) {
         Scale(*picture, *frame);
     } else { // not straight into the frame: the scaler also writes behind its rows
-        const av::Frame fitted = fittedPool_.Get(output_.format, fit_.fittedWidth, fit_.fittedHeight);
+        const av::Frame fitted = fittedPool_.Get(settings_.format, fit_.fittedWidth, fit_.fittedHeight);
         Scale(*picture, *fitted);
-        PaintBlack(*frame, output_.fullRange);
+        PaintBlack(*frame, settings_.fullRange);
         PutInto(*frame, *fitted, fit_);
     }
-    const auto repeat = output_.format == AV_PIX_FMT_YUV420P10 ? RepeatEdges<uint16_t> : RepeatEdges<uint8_t>;
-    repeat(*frame, output_.padWidth, output_.padHeight);
+    const auto repeat =
+        settings_.format == AV_PIX_FMT_YUV420P10 ? RepeatEdges<uint16_t> : RepeatEdges<uint8_t>;
+    repeat(*frame, settings_.padWidth, settings_.padHeight);
     return frame;
 }
 
@@ -169,16 +167,17 @@ void PictureScaler::PrepareFor(const AVFrame& picture) {
     sourceWidth_ = picture.width;
     sourceHeight_ = picture.height;
     sourceFormat_ = picture.format;
-    fit_ = FitPicture(picture.width, picture.height, sampleAspect_, output_.width, output_.height, stretch_);
+    fit_ = FitPicture(picture.width, picture.height, settings_.sourceAspect, settings_.width,
+                      settings_.height, settings_.stretch);
     scaler_.reset(sws_getContext(picture.width, picture.height, static_cast<AVPixelFormat>(picture.format),
-                                 fit_.fittedWidth, fit_.fittedHeight, output_.format,
+                                 fit_.fittedWidth, fit_.fittedHeight, settings_.format,
                                  SWS_BICUBIC | SWS_ACCURATE_RND | SWS_BITEXACT, nullptr, nullptr, nullptr));
     if (!scaler_)
         throw WriterFailure(kWriterErrorEncode, "Pictures of " + std::to_string(picture.width) + "x" +
                                                     std::to_string(picture.height) + " cannot be scaled.");
-    sws_setColorspaceDetails(scaler_.get(), sws_getCoefficients(output_.sourceMatrix),
-                             sourceFullRange_ ? 1 : 0, sws_getCoefficients(output_.matrix),
-                             output_.fullRange ? 1 : 0, 0, 1 << 16, 1 << 16);
+    sws_setColorspaceDetails(scaler_.get(), sws_getCoefficients(settings_.sourceMatrix),
+                             settings_.sourceFullRange ? 1 : 0, sws_getCoefficients(settings_.matrix),
+                             settings_.fullRange ? 1 : 0, 0, 1 << 16, 1 << 16);
 }
 
 } // namespace writer

@@ -49,20 +49,23 @@ private:
 /// Not thread-safe. A change of size or depth in mid-stream is taken as it comes.
 class PictureScaler {
 public:
-    /// Output pictures of `width` by `height`, or of one pixel more where `padWidth` and `padHeight` say so:
-    /// the last column and row are then repeated.
-    struct Output {
-        int width;
+    struct Settings {
+        // Of the output's pictures.
+        int width; ///< In pixels, as `height`, without what is padded.
         int height;
-        int padWidth;
+        int padWidth; ///< 0 or 1: so many times the last column is repeated; `padHeight`: the last row.
         int padHeight;
         AVPixelFormat format;
-        bool fullRange;
-        int sourceMatrix = SWS_CS_DEFAULT; ///< FFmpeg's SWS_CS_...
-        int matrix = SWS_CS_DEFAULT;       ///< Likewise, where the format is not RGB.
+        bool fullRange;              ///< Luma covers 0 to 255.
+        int matrix = SWS_CS_DEFAULT; ///< FFmpeg's SWS_CS_..., where the format is not RGB.
+        // Of the source's.
+        AVRational sourceAspect; ///< Shape of their pixels.
+        bool sourceFullRange;
+        int sourceMatrix = SWS_CS_DEFAULT;
+        bool stretch; ///< See FitPicture.
     };
 
-    PictureScaler(const Output& output, AVRational sampleAspect, bool stretch, bool sourceFullRange);
+    explicit PictureScaler(const Settings& settings) : settings_(settings) {}
 
     /// The picture as the encoder takes it: `picture` itself when nothing needs to change. Planar 4:2:0 only.
     av::Frame Convert(av::Frame picture);
@@ -71,10 +74,7 @@ private:
     void PrepareFor(const AVFrame& picture);
     void Scale(const AVFrame& picture, AVFrame& scaled);
 
-    const Output output_;
-    const AVRational sampleAspect_;
-    const bool stretch_;
-    const bool sourceFullRange_;
+    const Settings settings_;
     PictureFit fit_;
     int sourceWidth_ = 0;
     int sourceHeight_ = 0;

@@ -35,7 +35,7 @@ PictureStage::PictureStage(const PicturePlan& plan, EncoderFlags flags)
       encoder_(*plan.codec, plan.settings, flags, plan.clock.ticksPerPicture,
                plan.end && plan.codec->looksAhead.at(static_cast<std::size_t>(plan.settings.speed)) > 0),
       pacer_(plan.clock, plan.keepStamps),
-      scaler_(plan.picture, plan.sourceAspect, plan.stretch, plan.sourceFullRange),
+      scaler_(plan.scaling),
       thread_(kMostPictures, 0,
               {L"MediaWriter::The conversion waits for the picture encoder",
                L"MediaWriter::The picture encoder waits for the conversion"}) {
