@@ -1,7 +1,8 @@
 #include "writer/BesideStage.h"
 
 #include "media/MediaRecords.h"
-#include "writer/PacketTracks.h"
+#include "writer/CueTracks.h"
+#include "writer/SoundPackets.h"
 #include "writer/SoundStage.h"
 #include "writer/WriterFailure.h"
 
@@ -15,7 +16,7 @@ constexpr size_t kMostSteps = 8;
 constexpr int64_t kStep = kTicksPerSecond / 10;
 
 /// Sound that is encoded as the engine's is.
-class EncodedSound final : public BesideTrack {
+class EncodedSound final : public TrackStage {
 public:
     EncodedSound(const TrackPlan& plan, const Container& container, EncoderFlags flags)
         : plan_(plan),
@@ -82,11 +83,13 @@ private:
 };
 
 /// Makes what the plan says, for the container. Throws WriterFailure.
-std::unique_ptr<BesideTrack> MakeBesideTrack(const TrackPlan& plan, const Container& container,
-                                             EncoderFlags flags, bool isFirst) {
+std::unique_ptr<TrackStage> MakeTrackStage(const TrackPlan& plan, const Container& container,
+                                           EncoderFlags flags, bool isFirst) {
     if (plan.sound)
         return std::make_unique<EncodedSound>(plan, container, flags);
-    return MakePacketTrack(*plan.track, container, isFirst);
+    if (IsSound(*plan.track))
+        return MakeSoundPackets(*plan.track, container, isFirst);
+    return MakeCueTrack(*plan.track, container);
 }
 
 } // namespace
@@ -103,17 +106,17 @@ BesideStage::~BesideStage() {
 
 void BesideStage::Add(const TrackPlan& plan, const Container& container, EncoderFlags flags, bool isFirst,
                       PacketWriter& file) {
-    std::unique_ptr<BesideTrack> writer = MakeBesideTrack(plan, container, flags, isFirst);
-    const int stream = file.AddStream(writer->Stream());
-    tracks_.push_back({&plan, stream, std::move(writer)});
+    std::unique_ptr<TrackStage> stage = MakeTrackStage(plan, container, flags, isFirst);
+    const int stream = file.AddStream(stage->Stream());
+    tracks_.push_back({&plan, stream, std::move(stage)});
 }
 
 void BesideStage::Start(int64_t begin, const std::function<void(AVPacket& packet, int stream)>& write,
                         const StageFailure& failed) {
     begin_ = begin;
-    for (Track& track : tracks_)
-        track.writer->Start([write, stream = track.stream](AVPacket& packet) { write(packet, stream); },
-                            failed);
+    for (Entry& track : tracks_)
+        track.stage->Start([write, stream = track.stream](AVPacket& packet) { write(packet, stream); },
+                           failed);
     thread_.Start([this] { Run(); }, failed);
 }
 
@@ -132,25 +135,25 @@ void BesideStage::Finish(int64_t sourceTime) {
 
 void BesideStage::Cancel() {
     thread_.Cancel();
-    for (Track& track : tracks_)
-        track.writer->Cancel();
+    for (Entry& track : tracks_)
+        track.stage->Cancel();
 }
 
 void BesideStage::Join() {
     thread_.Join();
-    for (Track& track : tracks_)
-        track.writer->Join();
+    for (Entry& track : tracks_)
+        track.stage->Join();
 }
 
 void BesideStage::Run() {
     while (const std::optional<Step> step = thread_.Queue().Pop())
-        for (Track& track : tracks_)
+        for (Entry& track : tracks_)
             Read(track, *step);
-    for (Track& track : tracks_)
-        track.writer->Finish();
+    for (Entry& track : tracks_)
+        track.stage->Finish();
 }
 
-void BesideStage::Read(Track& track, const Step& step) {
+void BesideStage::Read(Entry& track, const Step& step) {
     const auto next = [&](WriterTrackItem& item) {
         return track.plan->track->next(track.plan->track->context, step.time, step.closing ? 1 : 0, &item) !=
                0;
@@ -159,11 +162,11 @@ void BesideStage::Read(Track& track, const Step& step) {
     while (!thread_.Cancelled() && next(item)) {
         if (track.plan->sound ? item.pSound == nullptr : item.pPacket == nullptr)
             throw WriterFailure(kWriterErrorArgument, "The reader of a further track gave nothing.");
-        if (!track.writer->Take(item, item.llTime - *begin_))
+        if (!track.stage->Take(item, item.llTime - *begin_))
             return;
     }
     if (!step.closing)
-        track.writer->Reach(std::min(step.time, item.llTime) - *begin_);
+        track.stage->Reach(std::min(step.time, item.llTime) - *begin_);
 }
 
 } // namespace writer

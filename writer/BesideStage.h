@@ -12,6 +12,7 @@
 #include "writer/FilePlan.h"
 #include "writer/PacketWriter.h"
 #include "writer/StageThread.h"
+#include "writer/TrackStage.h"
 
 #include <cstdint>
 #include <functional>
@@ -20,36 +21,6 @@
 #include <vector>
 
 namespace writer {
-
-/// What becomes of one track. Start to Finish are called on one thread.
-class BesideTrack {
-public:
-    BesideTrack() = default;
-    BesideTrack(const BesideTrack&) = delete;
-    BesideTrack& operator=(const BesideTrack&) = delete;
-    virtual ~BesideTrack() = default;
-
-    /// As the multiplexer gets it; valid as long as the track.
-    virtual MuxedStream Stream() const = 0;
-
-    /// `take` gets the packets, on any thread.
-    virtual void Start(PacketTaker take, StageFailure failed) = 0;
-
-    /// An item, to be shown at `time` of the file (100 ns units), which can lie before its begin. False when
-    /// the track has ended.
-    virtual bool Take(const WriterTrackItem& item, int64_t time) = 0;
-
-    /// No item begins before `time` any more.
-    virtual void Reach(int64_t /*time*/) {}
-
-    /// Of sound that is handed on as it comes, from what is heard first to the end.
-    virtual double Seconds() const { return 0; }
-
-    /// Nothing more will come.
-    virtual void Finish() = 0;
-    virtual void Cancel() = 0;
-    virtual void Join() = 0;
-};
 
 /// All functions but Cancel are called on one thread.
 class BesideStage {
@@ -66,7 +37,7 @@ public:
     bool Empty() const { return tracks_.empty(); }
 
     /// The first track's, once it is joined.
-    double Seconds() const { return tracks_.empty() ? 0 : tracks_.front().writer->Seconds(); }
+    double Seconds() const { return tracks_.empty() ? 0 : tracks_.front().stage->Seconds(); }
 
     /// Starts the threads. Time 0 of the file is `begin` in the source, in 100 ns units as all times.
     void Start(int64_t begin, const std::function<void(AVPacket& packet, int stream)>& write,
@@ -86,16 +57,16 @@ private:
         int64_t time; ///< Of the source.
         bool closing;
     };
-    struct Track {
+    struct Entry {
         const TrackPlan* plan;
-        int stream;
-        std::unique_ptr<BesideTrack> writer;
+        int stream; ///< Number in the file.
+        std::unique_ptr<TrackStage> stage;
     };
 
     void Run();
-    void Read(Track& track, const Step& step);
+    void Read(Entry& track, const Step& step);
 
-    std::vector<Track> tracks_;
+    std::vector<Entry> tracks_;
     std::optional<int64_t> begin_;
     int64_t reached_ = INT64_MIN;
     StageThread<Step> thread_;

@@ -1,27 +1,19 @@
-#include "writer/PacketTracks.h"
+#include "writer/CueTracks.h"
 
-#include "media/FourCC.h"
-#include "media/MediaRecords.h"
 #include "platform/LogRoute.h"
 #include "writer/CueRow.h"
 #include "writer/FileRecord.h"
+#include "writer/PacketTrack.h"
 #include "writer/TextRows.h"
 #include "writer/WriterFailure.h"
 
-extern "C" {
-#include <libavutil/intreadwrite.h>
-}
-
 #include <algorithm>
-#include <array>
 #include <cerrno>
-#include <cmath>
-#include <cstdlib>
-#include <cstring>
-#include <limits>
+#include <new>
 #include <optional>
 #include <string>
 #include <utility>
+#include <vector>
 
 namespace writer {
 namespace {
@@ -29,7 +21,6 @@ namespace {
 /// Of the times of cues. MP4's multiplexer compares them with those of other tracks without regard to units:
 /// no other may be finer.
 constexpr AVRational kCueUnit{1, 192000};
-constexpr AVRational kTick{1, kTicksPerSecond};
 constexpr int64_t kFarthest = 1000 * 3600 * kTicksPerSecond; // of a text's begin, in a movie that is none
 constexpr int64_t kLongest = 3600 * kTicksPerSecond;         // of a packet in MP4, whose lengths have 31 bits
 constexpr int kMostOfText = 65535; // bytes: MP4 has no more, and who reads more takes for ever
@@ -37,20 +28,15 @@ constexpr int64_t kUnknownLength = 5 * kTicksPerSecond; // of a text that does n
 
 const Carriage kAsUsual{};
 
-/// What both kinds have in common: they do their work on the stage's thread.
-class PacketTrack : public BesideTrack {
+/// What both kinds have in common.
+class CueTrack : public PacketTrack {
 public:
-    PacketTrack(const Track& track, AVRational unit)
-        : track_(track), unit_(unit), parameters_(av::NewParameters()) {}
+    explicit CueTrack(const Track& track) : PacketTrack(track, kCueUnit) {}
 
     MuxedStream Stream() const override {
         return {
             .parameters = parameters_.get(), .unit = unit_, .carriage = &kAsUsual, .label = &track_.label};
     }
-    void Start(PacketTaker take, StageFailure /*failed*/) override { take_ = std::move(take); }
-    void Finish() override {}
-    void Cancel() override {}
-    void Join() override {}
 
 protected:
     /// `packet` at its time in the file, in 100 ns units.
@@ -72,16 +58,11 @@ protected:
         }
         Send(packet, begin, end - begin);
     }
-    void HandOn(AVPacket& packet) { take_(packet); }
 
     void Drop(const char* what, int error) {
         ++*track_.lostCues;
         WriteLog(kLogWarning, "A subtitle could not be %s: %s.", what, av::ErrorText(error).c_str());
     }
-
-    const Track& track_;
-    const AVRational unit_;
-    av::CodecParameters parameters_;
 
 private:
     void HandOnEmpty(int64_t begin, int64_t end) {
@@ -95,20 +76,19 @@ private:
     }
 
     void Send(AVPacket& packet, int64_t begin, int64_t duration) {
-        packet.pts = packet.dts = av_rescale_q(begin, kTick, unit_);
-        packet.duration = av_rescale_q(begin + duration, kTick, unit_) - packet.pts;
+        packet.pts = packet.dts = av_rescale_q(begin, kItemUnit, unit_);
+        packet.duration = av_rescale_q(begin + duration, kItemUnit, unit_) - packet.pts;
         packet.flags |= AV_PKT_FLAG_KEY;
-        HandOn(packet);
+        PacketTrack::HandOn(packet);
     }
 
-    PacketTaker take_;
     std::optional<int64_t> end_; // of the packet before
 };
 
-/// Subtitles as they are.
-class CopiedPackets final : public PacketTrack {
+/// As they are.
+class CopiedCues final : public CueTrack {
 public:
-    explicit CopiedPackets(const Track& track) : PacketTrack(track, kCueUnit) {
+    explicit CopiedCues(const Track& track) : CueTrack(track) {
         av::CheckMemory(avcodec_parameters_copy(parameters_.get(), track.parameters.get()));
     }
 
@@ -122,99 +102,6 @@ public:
         HandOn(*packet, begin, ends ? time + item.llDuration - begin : 0);
         return true;
     }
-};
-
-/// Sound as it is, behind each other to the sample.
-class CopiedSound final : public PacketTrack {
-public:
-    CopiedSound(const Track& track, const Container& container, bool isFirst)
-        : PacketTrack(track, {1, std::max(track.parameters->sample_rate, 1)}),
-          container_(container),
-          carriage_(FindCarriage(container, track.parameters->codec_id)) {
-        av::CheckMemory(avcodec_parameters_copy(parameters_.get(), track.parameters.get()));
-        if (!isFirst)
-            parameters_->initial_padding = 0;
-        if (parameters_->codec_id == AV_CODEC_ID_OPUS)
-            TellRunUp();
-        const int* rates = carriage_.sampleRates;
-        while (rates != nullptr && *rates != 0 && *rates != parameters_->sample_rate)
-            ++rates;
-        if (rates != nullptr && *rates == 0)
-            throw WriterFailure(kWriterErrorCodec, std::string(container.name) + " cannot carry sound of " +
-                                                       std::to_string(parameters_->sample_rate) +
-                                                       " Hz of this codec.");
-    }
-
-    MuxedStream Stream() const override {
-        return {.parameters = parameters_.get(),
-                .unit = unit_,
-                .runUp = parameters_->initial_padding,
-                .carriage = &carriage_,
-                .label = &track_.label};
-    }
-
-    bool Take(const WriterTrackItem& item, int64_t time) override {
-        const av::Packet packet = av::CopyOf(*item.pPacket);
-        const int64_t begin = av_rescale_q(time, kTick, unit_);
-        const bool follows = end_ && std::abs(begin - *end_) <= kRounding;
-        if ((container_.ways & kCountsSamples) != 0)
-            RequireNoGap(begin);
-        if (container_.code == FourCC("MP3 "))
-            KeepFromUnderflow(*packet);
-        packet->pts = packet->dts =
-            follows ? *end_ : std::max<int64_t>(begin, -int64_t{parameters_->initial_padding});
-        packet->duration = av_rescale_q(item.llDuration, kTick, unit_);
-        first_ = first_.value_or(packet->pts);
-        end_ = packet->pts + packet->duration;
-        HandOn(*packet);
-        return true;
-    }
-
-    double Seconds() const override {
-        const int64_t samples = end_ ? *end_ - *first_ - parameters_->initial_padding : 0;
-        return static_cast<double>(std::max<int64_t>(0, samples)) * av_q2d(unit_);
-    }
-
-private:
-    static constexpr int64_t kRounding = 2; // samples
-
-    /// Where only the number of samples tells the time, all behind a gap would be heard too early. Pictures
-    /// begin at 0.
-    void RequireNoGap(int64_t begin) const {
-        constexpr double kAudible = 0.1; // seconds
-        const bool hasPictures = container_.video.front() != 0;
-        const int64_t before = end_ ? *end_ : hasPictures ? 0 : begin;
-        const double gap = static_cast<double>(begin - before) * av_q2d(unit_);
-        if (gap > kAudible)
-            throw WriterFailure(kWriterErrorCodec, std::string(container_.name) +
-                                                       " cannot hold sound as it is that pauses for " +
-                                                       std::to_string(std::lround(gap * 1000)) +
-                                                       " ms; convert it.");
-    }
-
-    /// The multiplexer takes the decoder's delay off the samples to leave out that a packet tells, and
-    /// writes a great number into the header where they are fewer.
-    static void KeepFromUnderflow(AVPacket& packet) {
-        constexpr uint32_t kDecoderDelay = 528 + 1;
-        uint8_t* skipped = av_packet_get_side_data(&packet, AV_PKT_DATA_SKIP_SAMPLES, nullptr);
-        if (skipped != nullptr)
-            AV_WL32(skipped, std::max(AV_RL32(skipped), kDecoderDelay));
-    }
-
-    /// Its header tells it as well.
-    void TellRunUp() {
-        constexpr int kField = 10;
-        constexpr int kRate = 48000;
-        if (parameters_->extradata_size >= kField + 2)
-            AV_WL16(parameters_->extradata + kField,
-                    static_cast<uint16_t>(
-                        av_rescale(parameters_->initial_padding, kRate, parameters_->sample_rate)));
-    }
-
-    const Container& container_;
-    const Carriage& carriage_;
-    std::optional<int64_t> first_; // where the first packet begins
-    std::optional<int64_t> end_;   // of the last one
 };
 
 struct SubtitleFree {
@@ -244,11 +131,11 @@ av::CodecContext OpenCues(const AVCodec* codec, const AVCodecParameters* paramet
     return context;
 }
 
-/// Subtitles of text in another form than they have.
-class ConvertedText final : public PacketTrack {
+/// Of text, in another form than they have.
+class ConvertedCues final : public CueTrack {
 public:
-    ConvertedText(const Track& track, AVCodecID target)
-        : PacketTrack(track, kCueUnit),
+    ConvertedCues(const Track& track, AVCodecID target)
+        : CueTrack(track),
           decoder_(
               OpenCues(avcodec_find_decoder(track.parameters->codec_id), track.parameters.get(), nullptr)),
           encoder_(OpenCues(avcodec_find_encoder(target), nullptr, decoder_.get())),
@@ -370,13 +257,11 @@ private:
 
 } // namespace
 
-std::unique_ptr<BesideTrack> MakePacketTrack(const Track& track, const Container& container, bool isFirst) {
-    if (IsSound(track))
-        return std::make_unique<CopiedSound>(track, container, isFirst);
+std::unique_ptr<TrackStage> MakeCueTrack(const Track& track, const Container& container) {
     const AVCodecID target = PacketForm(container, track.parameters->codec_id);
     if (target == track.parameters->codec_id)
-        return std::make_unique<CopiedPackets>(track);
-    return std::make_unique<ConvertedText>(track, target);
+        return std::make_unique<CopiedCues>(track);
+    return std::make_unique<ConvertedCues>(track, target);
 }
 
 } // namespace writer
