@@ -3,7 +3,7 @@
 #include "host/convert/Failure.h"
 #include "host/convert/OutputCheck.h"
 #include "host/pieces/OutputNames.h"
-#include "host/pieces/PieceFile.h"
+#include "host/pieces/PiecePlaces.h"
 #include "host/pieces/PieceRequest.h"
 #include "host/pieces/PlanText.h"
 #include "host/pieces/WholeFile.h"

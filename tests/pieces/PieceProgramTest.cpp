@@ -1,8 +1,8 @@
 // The program's plans, pieces and joins, as a farm and as people use them.
 #include "host/pieces/Foreman.h"
 #include "host/pieces/Joiner.h"
-#include "host/pieces/PieceFile.h"
 #include "host/pieces/PieceRequest.h"
+#include "host/pieces/PieceSeal.h"
 #include "host/pieces/PlanText.h"
 #include "tests/pieces/ExitCodes.h"
 #include "tests/pieces/Packets.h"

@@ -1,10 +1,9 @@
-// The files that pieces are kept in: their names, and the seal at their end by which they are recognised.
-//
-// The seal stands in the same file, so that a piece and what vouches for it get their name in one step:
+// The seal at the end of a piece's file, by which it is recognised: in the same file, so that a piece and
+// what vouches for it get their name in one step.
 //
 //     MCSEAL1 / hash of the plan / number of the piece / bytes before the seal / SHA-256 of all that
-#ifndef MOVIECONV_HOST_PIECES_PIECEFILE_H
-#define MOVIECONV_HOST_PIECES_PIECEFILE_H
+#ifndef MOVIECONV_HOST_PIECES_PIECESEAL_H
+#define MOVIECONV_HOST_PIECES_PIECESEAL_H
 
 #include "host/pieces/Plan.h"
 
@@ -24,17 +23,6 @@ int64_t SealPiece(const std::string& file, const Plan& plan, const std::string& 
 /// false.
 std::optional<std::string> FaultOf(const Plan& plan, const std::string& planPath, int number,
                                    const std::function<bool()>& goesOn);
-
-/// Throws Failure when something that is no piece, or that `request` reads, has the place of a piece of a
-/// plan of that name: of this one, or of any.
-void RequirePlaces(const std::string& planPath, const Request& request, std::optional<int> only);
-
-/// How many pieces stand beside a plan's name, whosever they are.
-int CountPieces(const std::string& planPath);
-
-/// Removes all pieces beside the plan, and what was in the making; nothing else whatever it is called, and
-/// nothing that `request` reads.
-void RemovePieces(const std::string& planPath, const Request& request);
 
 } // namespace movieconv
 
