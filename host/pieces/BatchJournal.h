@@ -31,13 +31,13 @@ public:
     /// `settings` is what SettingsAsJson gives, as text.
     State StateOf(const std::string& output, const SourceMark& source, const std::string& settings) const;
 
+    /// What a run that broke off left of the output, under a temporary name; nothing when there is none.
+    std::optional<std::string> Unfinished(const std::string& output) const;
+
     /// Both throw Failure when the line cannot be written. `temporary` is the output's name until it is
     /// complete: what stands under its own name later may be somebody else's.
     void NoteBegun(const std::string& output, const SourceMark& source, const std::string& settings,
                    const std::string& temporary);
-    /// What a run that broke off left of the output, under a temporary name; nothing when there is none.
-    std::optional<std::string> Unfinished(const std::string& output) const;
-
     void NoteDone(const std::string& output, const SourceMark& source, const std::string& settings);
 
 private:

@@ -52,7 +52,6 @@ public:
     void Remove() const;
 
 private:
-    std::string Header() const;
     struct Entry {
         std::string clip; ///< Its name.
         Json mark;
@@ -60,6 +59,7 @@ private:
         std::string opened; ///< BirthOf the clip behind it, which was being written then.
     };
 
+    std::string Header() const;
     static std::optional<Entry> EntryOn(const std::string& line);
     bool IsFinished(const Entry& entry) const;
 

@@ -21,7 +21,6 @@ public:
 
     void Hold();
     void Release();
-    bool IsHeld() const { return wanted_; }
 
 Q_SIGNALS:
     /// The machine may go to sleep meanwhile, for the reason told.

@@ -72,7 +72,6 @@ public:
     const Naming& CurrentNaming() const { return naming_; }
     /// What new entries start with.
     void SetDefaults(const Wishes& wishes) { defaults_ = wishes; }
-    const Wishes& Defaults() const { return defaults_; }
 
     /// Changes an entry, tells and, with `keep`, writes the journal.
     void Change(quint64 id, const std::function<void(Entry&)>& change, bool keep);
