@@ -1,4 +1,5 @@
-// The five functions of the media writer and the functions of its status header: no exception leaves them.
+// The five functions of the media writer, and those of its status header for sets and their files: no
+// exception leaves them.
 #include "media/MediaWriter.h"
 
 #include "api/Version.h"
@@ -6,6 +7,7 @@
 #include "text/Utf8.h"
 #include "writer/FilePlan.h"
 #include "writer/FormatTable.h"
+#include "writer/Guarded.h"
 #include "writer/JoinedFile.h"
 #include "writer/MediaFile.h"
 #include "writer/OptionSets.h"
@@ -20,21 +22,12 @@ namespace {
 
 using writer::Extras;
 using writer::FileRecord;
+using writer::Guarded;
 using writer::JoinedFile;
 using writer::MediaFile;
 using writer::OptionSet;
 using writer::OptionSets;
 using writer::WriterFailure;
-
-/// The result of `call`; `otherwise` when it throws.
-template <typename Result, typename Call>
-Result Guarded(Result otherwise, Call call) noexcept {
-    try {
-        return call();
-    } catch (...) {
-        return otherwise;
-    }
-}
 
 /// The file that this thread created or closed last.
 thread_local std::shared_ptr<const FileRecord> t_record;
@@ -93,15 +86,6 @@ int CopyStatus(const std::shared_ptr<const FileRecord>& record, WriterStatus* st
     return record && writer::CopyStatus(record->Snapshot(), status) ? 1 : 0;
 }
 
-/// Changes what the files of a set carry; 1 when `change` did.
-template <typename Change>
-int ChangeExtras(uint32_t number, Change change) noexcept {
-    return Guarded(0, [&] {
-        const std::shared_ptr<OptionSet> set = OptionSets::Instance().Find(number);
-        return set && set->ChangeExtras(change) ? 1 : 0;
-    });
-}
-
 /// What `call` gives of the set; 0 when there is none of that number.
 template <typename Call>
 int WithSet(uint32_t number, Call call) noexcept {
@@ -148,42 +132,11 @@ int MWCloseMediaFile(void* file, ProgressCallback /*callback*/, void* /*context*
     return Guarded(0, [&] { return owned && owned->Close() ? 1 : 0; });
 }
 
-uint32_t MWGetFormatTraits(uint32_t format) {
-    return Guarded<uint32_t>(0, [&] { return writer::FormatTraits(format); });
-}
-
 uint32_t MWRegisterOptions(const WriterOptions* options) {
     return Guarded<uint32_t>(0, [&] {
         const auto known = writer::ReadOptions(options);
         return known ? OptionSets::Instance().Register(*known) : 0;
     });
-}
-
-int MWGetQualityScale(uint32_t code, double* best, double* worst) {
-    const writer::PictureCodec* codec = writer::FindPictureCodec(code);
-    if (codec == nullptr || codec->quality.kind == writer::QualityKind::kNone || best == nullptr ||
-        worst == nullptr)
-        return 0;
-    *best = codec->quality.best;
-    *worst = codec->quality.worst;
-    return 1;
-}
-
-uint32_t MWFindCodec(uint32_t format, uint32_t code, int forSound) {
-    const writer::Container* container = writer::FindContainer(format);
-    if (container == nullptr)
-        return 0;
-    if (forSound != 0) {
-        const writer::SoundCodec* codec = writer::FindSoundCodec(*container, code);
-        return codec != nullptr && writer::FindEncoder(*codec, 16) != nullptr ? codec->code : 0;
-    }
-    const writer::PictureCodec* codec = writer::FindPictureCodec(*container, code);
-    return codec != nullptr && writer::FindEncoder(*codec) != nullptr ? codec->code : 0;
-}
-
-int MWGetPictureDepth(uint32_t code) {
-    const writer::PictureCodec* codec = writer::FindPictureCodec(code);
-    return codec == nullptr ? 0 : writer::TakesDeep(*codec) ? 10 : 8;
 }
 
 int MWSetOptions(uint32_t set, const WriterOptions* options) {
@@ -197,121 +150,6 @@ int MWSetOptions(uint32_t set, const WriterOptions* options) {
 
 int MWUnregisterOptions(uint32_t set) {
     return Guarded(0, [&] { return OptionSets::Instance().Unregister(set) ? 1 : 0; });
-}
-
-int MWSetTag(uint32_t set, const char* key, const char* value) {
-    return ChangeExtras(set, [&](Extras& extras) { return writer::SetTag(extras.tags, key, value); });
-}
-
-int MWCarriesTag(uint32_t format, const char* key, const char* value) {
-    return Guarded(0, [&] {
-        const writer::Container* container = writer::FindContainer(format);
-        const bool isTold = key != nullptr && value != nullptr;
-        return container != nullptr && isTold && writer::CarriesTag(*container, key, value) ? 1 : 0;
-    });
-}
-
-int MWCarriesTrackTag(uint32_t format, const char* key, const char* value) {
-    return Guarded(0, [&] {
-        const writer::Container* container = writer::FindContainer(format);
-        const bool isTold = key != nullptr && value != nullptr;
-        return container != nullptr && isTold && writer::CarriesTrackTag(*container, key, value) ? 1 : 0;
-    });
-}
-
-int MWCarriedTrackFlags(uint32_t format) {
-    const writer::Container* container = writer::FindContainer(format);
-    return container != nullptr ? container->trackFlags : 0;
-}
-
-int MWSetTrackTag(uint32_t set, int track, const char* key, const char* value) {
-    return ChangeExtras(set, [&](Extras& extras) {
-        writer::TrackLabel* label = writer::FindLabel(extras, track);
-        return label != nullptr && writer::SetTag(label->tags, key, value);
-    });
-}
-
-int MWSetTrackFlags(uint32_t set, int track, int flags) {
-    return ChangeExtras(set, [&](Extras& extras) {
-        writer::TrackLabel* label = writer::FindLabel(extras, track);
-        if (label != nullptr)
-            label->flags = flags;
-        return label != nullptr;
-    });
-}
-
-int MWAddTrack(uint32_t set, const WriterTrack* track) {
-    return ChangeExtras(set, [&](Extras& extras) { return writer::AddTrack(extras, track); });
-}
-
-int64_t MWGetLostCues(uint32_t set, int track) {
-    return Guarded<int64_t>(0, [&]() -> int64_t {
-        const std::shared_ptr<OptionSet> found = OptionSets::Instance().Find(set);
-        const int further = track - kWriterTrackFurther;
-        if (!found || further < 0)
-            return 0;
-        const std::vector<writer::Track>& tracks = found->ExtraParts()->tracks;
-        return further < static_cast<int>(tracks.size())
-                   ? tracks[static_cast<std::size_t>(further)].lostCues->load()
-                   : 0;
-    });
-}
-
-int MWCarriesPackets(uint32_t format, const char* codec) {
-    return Guarded(0, [&] {
-        const writer::Container* container = writer::FindContainer(format);
-        const AVCodecDescriptor* known = codec != nullptr ? avcodec_descriptor_get_by_name(codec) : nullptr;
-        return container != nullptr && known != nullptr &&
-                       writer::PacketForm(*container, known->id) != AV_CODEC_ID_NONE
-                   ? 1
-                   : 0;
-    });
-}
-
-int MWAddChapter(uint32_t set, int64_t begin, int64_t end, const char* title) {
-    return ChangeExtras(set, [&](Extras& extras) {
-        if (end <= begin)
-            return false;
-        extras.chapters.push_back({begin, end, title != nullptr ? title : ""});
-        return true;
-    });
-}
-
-int MWSetCover(uint32_t set, const void* data, int64_t size) {
-    return ChangeExtras(set, [&](Extras& extras) {
-        extras.cover = writer::MakeCover(data, size);
-        return extras.cover.codec != AV_CODEC_ID_NONE;
-    });
-}
-
-int MWDescribeCover(uint32_t set, const char* fileName, const char* description) {
-    return ChangeExtras(set, [&](Extras& extras) {
-        extras.cover.fileName = fileName != nullptr ? fileName : "";
-        extras.cover.description = description != nullptr ? description : "";
-        return extras.cover.codec != AV_CODEC_ID_NONE;
-    });
-}
-
-int MWAddAttachment(uint32_t set, const char* fileName, const char* mimeType, const void* data,
-                    int64_t size) {
-    return ChangeExtras(set, [&](Extras& extras) {
-        if (fileName == nullptr || *fileName == '\0' || mimeType == nullptr || data == nullptr || size <= 0 ||
-            size > INT32_MAX)
-            return false;
-        const auto* bytes = static_cast<const uint8_t*>(data);
-        extras.attachments.push_back(
-            {fileName, mimeType, {}, std::make_shared<std::vector<uint8_t>>(bytes, bytes + size)});
-        return true;
-    });
-}
-
-int MWDescribeAttachment(uint32_t set, const char* description) {
-    return ChangeExtras(set, [&](Extras& extras) {
-        if (extras.attachments.empty())
-            return false;
-        extras.attachments.back().description = description != nullptr ? description : "";
-        return true;
-    });
 }
 
 int MWGetFileCount(uint32_t set) {
@@ -365,16 +203,6 @@ int MWPlanSound(const EncodeParam* param, const AudioFormat* audio, WriterSound*
         sound->nChannels = encoder.Context().ch_layout.nb_channels;
         sound->nChannelMask = av::SpeakersOf(encoder.Context().ch_layout);
         return 1;
-    });
-}
-
-int MWPicturesAhead(uint32_t codec, int speed) {
-    return Guarded(0, [&] {
-        const writer::PictureCodec* found = writer::FindPictureCodec(codec);
-        const int place = (speed != 0 ? speed : writer::kUsualSpeed) - 1;
-        return found == nullptr || place < 0 || place >= static_cast<int>(found->looksAhead.size())
-                   ? 0
-                   : found->looksAhead.at(static_cast<std::size_t>(place));
     });
 }
 
