@@ -100,10 +100,10 @@ void BesideSound::HandOut(int64_t samples, Item& item) {
     used_ += samples;
 }
 
-BesidePackets::BesidePackets(Source source, Clock clock, AVRational timeBase, const BesideBounds& bounds,
+BesidePackets::BesidePackets(Take take, Clock clock, AVRational timeBase, const BesideBounds& bounds,
                              Failures& failures)
     : BesideTrack(bounds, failures),
-      source_(std::move(source)),
+      take_(std::move(take)),
       clock_(std::move(clock)),
       timeBase_(timeBase),
       fileBegin_(bounds.begin) {}
@@ -116,7 +116,7 @@ void BesidePackets::Precede(std::vector<av::Packet> packets) {
 bool BesidePackets::Find(int64_t until, bool closing, Item& item) {
     KeepDivided();
     while (pending_.empty() || pending_.back().begin < until) {
-        Demuxer::Beside taken = source_(until, closing);
+        Demuxer::Beside taken = take_(until, closing);
         if (!taken.packet)
             break;
         Hold(std::move(taken.packet));

@@ -101,13 +101,13 @@ private:
 class BesidePackets final : public BesideTrack {
 public:
     /// As Demuxer::TakeBeside. Stamps count in `timeBase` from the source's start.
-    using Source = std::function<Demuxer::Beside(int64_t until, bool wait)>;
+    using Take = std::function<Demuxer::Beside(int64_t until, bool wait)>;
     using Clock = std::function<int64_t(int64_t stamp, AVRational timeBase)>;
 
-    BesidePackets(Source source, Clock clock, AVRational timeBase, const BesideBounds& bounds,
+    BesidePackets(Take take, Clock clock, AVRational timeBase, const BesideBounds& bounds,
                   Failures& failures);
 
-    /// Packets from before the begin, which the source may give once more.
+    /// Packets from before the begin, which `take` may give once more.
     void Precede(std::vector<av::Packet> packets);
 
 private:
@@ -124,7 +124,7 @@ private:
     void KeepDivided();
     void Hold(av::Packet packet);
 
-    const Source source_;
+    const Take take_;
     const Clock clock_;
     const AVRational timeBase_;
     int64_t fileBegin_;
