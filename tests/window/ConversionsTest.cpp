@@ -29,14 +29,7 @@ struct ConversionsTest : testing::Test {
         return Await([&] { return !dispatcher.IsWorking(); });
     }
 
-    void AwaitExamined(size_t count) {
-        ASSERT_TRUE(Await([&] {
-            const auto& entries = queue.Entries();
-            return entries.size() == count && std::none_of(entries.begin(), entries.end(), [](auto& entry) {
-                       return entry.IsBeingExamined();
-                   });
-        }));
-    }
+    void AwaitExamined(size_t count) { ASSERT_TRUE(::AwaitExamined(queue, count)); }
 };
 
 } // namespace

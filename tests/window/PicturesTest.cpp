@@ -35,14 +35,7 @@ struct PicturesTest : testing::Test {
         return Await([&] { return !app.TheDispatcher().IsWorking(); });
     }
 
-    void AwaitExamined(size_t count) {
-        ASSERT_TRUE(Await([&] {
-            const auto& entries = app.TheQueue().Entries();
-            return entries.size() == count && std::none_of(entries.begin(), entries.end(), [](auto& entry) {
-                       return entry.IsBeingExamined();
-                   });
-        }));
-    }
+    void AwaitExamined(size_t count) { ASSERT_TRUE(::AwaitExamined(app.TheQueue(), count)); }
 
     /// Keeps a picture of the window where the caller of the test wants one.
     void Photograph(const char* name) {

@@ -2,11 +2,13 @@
 #ifndef MOVIECONV_TESTS_WINDOW_SCRIPTEDRUNNER_H
 #define MOVIECONV_TESTS_WINDOW_SCRIPTEDRUNNER_H
 
+#include "host/window/model/Queue.h"
 #include "host/window/model/Runner.h"
 #include "tests/support/Gate.h"
 
 #include <QTest>
 
+#include <algorithm>
 #include <functional>
 #include <map>
 #include <mutex>
@@ -15,6 +17,16 @@
 /// way to whatever else is running.
 inline bool Await(const std::function<bool()>& condition) {
     return QTest::qWaitFor(condition, 900'000);
+}
+
+/// Likewise until the queue has so many movies, all of them looked at.
+inline bool AwaitExamined(const movieconv::window::Queue& queue, size_t count) {
+    return Await([&] {
+        const auto& entries = queue.Entries();
+        return entries.size() == count && std::none_of(entries.begin(), entries.end(), [](const auto& entry) {
+                   return entry.IsBeingExamined();
+               });
+    });
 }
 
 class ScriptedRunner : public movieconv::window::Runner {
