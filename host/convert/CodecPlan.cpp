@@ -85,7 +85,7 @@ void RequireQuality(uint32_t codec, double quality) {
 }
 
 /// One of rate and quality, and whatever is asked for wins over what is preferred.
-void PlanRate(PicturePlan& plan, const Request& request, int height) {
+void PlanRate(PictureCoding& plan, const Request& request, int height) {
     const Preferences& preferences = request.preferences;
     plan.maxRate = request.videoMaxRate ? request.videoMaxRate : preferences.videoMaxRate;
     if (request.videoRate) {
@@ -99,7 +99,7 @@ void PlanRate(PicturePlan& plan, const Request& request, int height) {
         plan.rate = preferences.videoRate;
 }
 
-void PlanDepth(PicturePlan& plan, const Request& request, const FileFormatInfo& format,
+void PlanDepth(PictureCoding& plan, const Request& request, const FileFormatInfo& format,
                const PictureStreamInfo& source) {
     const int most = MostDepth(request, format);
     if (request.depth && *request.depth > most) {
@@ -132,10 +132,10 @@ uint32_t SoundCodecFor(const Request& request, const FileFormatInfo& format) {
     return ChooseCodec(request.audioCodec, request.preferences.audioCodecs, format, true);
 }
 
-PicturePlan PlanPictures(const Request& request, const FileFormatInfo& format,
-                         const PictureStreamInfo& source) {
+PictureCoding PlanPictures(const Request& request, const FileFormatInfo& format,
+                           const PictureStreamInfo& source) {
     const Preferences& preferences = request.preferences;
-    PicturePlan plan;
+    PictureCoding plan;
     plan.codec = PictureCodecFor(request, format);
     plan.size = request.size;
     if (!plan.size && preferences.fitWithin)
@@ -161,13 +161,13 @@ PicturePlan PlanPictures(const Request& request, const FileFormatInfo& format,
 bool HasRates(const Request& request, const FileFormatInfo& format, const SourceInfo& source) {
     if (!source.pictures || format.bHasVideo == 0)
         return true;
-    const PicturePlan plan = PlanPictures(request, format, *source.pictures);
+    const PictureCoding plan = PlanPictures(request, format, *source.pictures);
     return !plan.quality && QualityScaleOf(plan.codec); // what has no scale loses nothing
 }
 
-SoundPlan PlanSound(const Request& request, const FileFormatInfo& format, const SoundStreamInfo& source) {
+SoundCoding PlanSound(const Request& request, const FileFormatInfo& format, const SoundStreamInfo& source) {
     const Preferences& preferences = request.preferences;
-    SoundPlan plan;
+    SoundCoding plan;
     plan.codec = SoundCodecFor(request, format);
     if (request.copySound)
         return plan;

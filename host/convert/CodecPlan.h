@@ -12,7 +12,7 @@
 namespace movieconv {
 
 /// What has no value is left to the engine and the encoder.
-struct PicturePlan {
+struct PictureCoding {
     uint32_t codec = 0;
     std::optional<Size> size;
     std::optional<double> frameRate;
@@ -26,7 +26,7 @@ struct PicturePlan {
     bool keepsHdr = false;
 };
 
-struct SoundPlan {
+struct SoundCoding {
     uint32_t codec = 0;
     std::optional<int32_t> channels;
     std::optional<int32_t> sampleRate;
@@ -46,9 +46,9 @@ int MostDepth(const Request& request, const FileFormatInfo& format);
 bool HasRates(const Request& request, const FileFormatInfo& format, const SourceInfo& source);
 
 /// Throws Failure as well when the codec has no such quality or depth.
-PicturePlan PlanPictures(const Request& request, const FileFormatInfo& format,
-                         const PictureStreamInfo& source);
-SoundPlan PlanSound(const Request& request, const FileFormatInfo& format, const SoundStreamInfo& source);
+PictureCoding PlanPictures(const Request& request, const FileFormatInfo& format,
+                           const PictureStreamInfo& source);
+SoundCoding PlanSound(const Request& request, const FileFormatInfo& format, const SoundStreamInfo& source);
 
 } // namespace movieconv
 

@@ -17,7 +17,7 @@ namespace {
 
 void PutPictures(EncodeParam& param, const FileFormatInfo& format, const Request& request,
                  const PictureStreamInfo& source) {
-    const PicturePlan plan = PlanPictures(request, format, source);
+    const PictureCoding plan = PlanPictures(request, format, source);
     param.fccVideo = plan.codec;
     if (plan.size) {
         param.nWidth = plan.size->width;
@@ -35,7 +35,7 @@ void PutPictures(EncodeParam& param, const FileFormatInfo& format, const Request
 
 void PutSound(EncodeParam& param, const FileFormatInfo& format, const Request& request,
               const SoundStreamInfo& source) {
-    const SoundPlan plan = PlanSound(request, format, source);
+    const SoundCoding plan = PlanSound(request, format, source);
     param.fccAudio = plan.codec;
     param.nChannels = plan.channels.value_or(param.nChannels);
     param.nSampleRate = plan.sampleRate.value_or(param.nSampleRate);

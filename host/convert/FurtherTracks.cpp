@@ -65,7 +65,7 @@ void FurtherTracks::AddSound(const StreamInfo& stream) {
         tracks_.push_back({{}, &sound, stream, &sound});
         return;
     }
-    const SoundPlan plan = PlanSound(request_, format_, *stream.sound);
+    const SoundCoding plan = PlanSound(request_, format_, *stream.sound);
     WriterTrack track{};
     track.nSampleRate = plan.sampleRate.value_or(stream.sound->sampleRate);
     track.nChannels = plan.channels.value_or(stream.sound->channels);

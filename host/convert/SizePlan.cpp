@@ -49,7 +49,7 @@ bool IsLossless(uint32_t soundCodec) {
     return IsAmong(soundCodec, {FourCC("PCM "), FourCC("FLAC"), FourCC("ALAC")});
 }
 
-double UncodedRate(const SoundPlan& plan, const SoundStreamInfo& source) {
+double UncodedRate(const SoundCoding& plan, const SoundStreamInfo& source) {
     return static_cast<double>(plan.sampleRate.value_or(source.sampleRate)) *
            plan.channels.value_or(source.channels) * source.bitsPerSample;
 }
@@ -59,7 +59,7 @@ double SoundRate(const Request& request, const FileFormatInfo& format, const Sou
                  int64_t codedRate) {
     if (request.copySound)
         return static_cast<double>(codedRate);
-    const SoundPlan plan = PlanSound(request, format, sound);
+    const SoundCoding plan = PlanSound(request, format, sound);
     if (plan.codec == FourCC("PCM "))
         return UncodedRate(plan, sound);
     return IsLossless(plan.codec) ? 0 : plan.rate.value_or(kUsualAudioBitrate);
@@ -82,7 +82,7 @@ std::optional<double> SoundRates(const Request& request, const FileFormatInfo& f
 
 /// Sets the sound's rate, `share` at most where that is enough; what it can take at most, in bits per second.
 double FitSound(Request& request, const FileFormatInfo& format, const SoundStreamInfo& source, double share) {
-    SoundPlan plan = PlanSound(request, format, source);
+    SoundCoding plan = PlanSound(request, format, source);
     const double sampleRate = plan.sampleRate.value_or(source.sampleRate);
     if (IsLossless(plan.codec))
         return UncodedRate(plan, source);
@@ -102,7 +102,7 @@ void FitPictures(Request& request, const FileFormatInfo& format, const PictureSt
                  double rate) {
     request.videoRate = static_cast<int32_t>(std::min<double>(rate, INT32_MAX));
     request.videoMaxRate = request.videoRate;
-    const PicturePlan plan = PlanPictures(request, format, source);
+    const PictureCoding plan = PlanPictures(request, format, source);
     if (request.size)
         return;
     const Size size = plan.size.value_or(Size{source.width, source.height});

@@ -23,7 +23,7 @@ std::string LayoutName(uint64_t speakers) {
     return text.data();
 }
 
-void TellLossOf(const SoundStreamInfo& sound, const SoundPlan& plan, EncodeParam param,
+void TellLossOf(const SoundStreamInfo& sound, const SoundCoding& plan, EncodeParam param,
                 std::vector<Sentence>& texts) {
     const int channels = plan.channels.value_or(sound.channels);
     const int rate = plan.sampleRate.value_or(sound.sampleRate);

@@ -50,7 +50,7 @@ WriterOptions OptionsFor(const Request& request, const SourceInfo& source) {
             writer.dSourceRate = source.pictures->frameRate;
     }
     if (const FileFormatInfo& format = ChooseFormat(request); source.pictures && format.bHasVideo != 0) {
-        const PicturePlan plan = PlanPictures(request, format, *source.pictures);
+        const PictureCoding plan = PlanPictures(request, format, *source.pictures);
         writer.bQuality = plan.quality ? 1 : 0;
         writer.dQuality = plan.quality.value_or(0);
         writer.nSpeed = plan.speed ? static_cast<int32_t>(*plan.speed) : 0;

@@ -180,7 +180,7 @@ int64_t MemoryPerPiece(const PictureStreamInfo& pictures) {
 
 /// Pictures behind its end that the encoder of a piece looks at.
 std::size_t PicturesAhead(const EncodeParam& param, const Request& request, const SourceInfo& source) {
-    const PicturePlan plan = PlanPictures(request, ChooseFormat(request), *source.pictures);
+    const PictureCoding plan = PlanPictures(request, ChooseFormat(request), *source.pictures);
     const int speed = plan.speed ? static_cast<int>(*plan.speed) : 0;
     return static_cast<std::size_t>(MWPicturesAhead(param.fccVideo, speed));
 }

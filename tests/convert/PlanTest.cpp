@@ -95,7 +95,7 @@ TEST(CodecPlan, WhatIsAskedForWinsOverWhatIsPreferred) {
     request.preferences.maxFrameRate = 30;
     request.preferences.maxChannels = 2;
     request.preferences.audioRate.from = {{1, 64'000}, {2, 128'000}, {6, 384'000}};
-    const PicturePlan preferred = PlanPictures(request, mkv, *source.pictures);
+    const PictureCoding preferred = PlanPictures(request, mkv, *source.pictures);
     EXPECT_EQ(preferred.codec, FourCC("H264"));
     EXPECT_EQ(preferred.quality, 23); // by the height of the source's pictures as they are made
     EXPECT_EQ(preferred.rate, std::nullopt);
@@ -103,7 +103,7 @@ TEST(CodecPlan, WhatIsAskedForWinsOverWhatIsPreferred) {
     EXPECT_EQ(preferred.size->width, 1280);
     EXPECT_EQ(preferred.size->height, 720);
     EXPECT_EQ(preferred.frameRate, std::nullopt); // the source has fewer
-    const SoundPlan sound = PlanSound(request, mkv, *source.sound);
+    const SoundCoding sound = PlanSound(request, mkv, *source.sound);
     EXPECT_EQ(sound.channels, 2);
     EXPECT_EQ(sound.rate, 128'000);
 
@@ -112,7 +112,7 @@ TEST(CodecPlan, WhatIsAskedForWinsOverWhatIsPreferred) {
     request.size = Size{640, 640};
     request.frameRate = 50;
     request.channels = 6;
-    const PicturePlan asked = PlanPictures(request, mkv, *source.pictures);
+    const PictureCoding asked = PlanPictures(request, mkv, *source.pictures);
     EXPECT_EQ(asked.codec, FourCC("XVID"));
     EXPECT_EQ(asked.quality, std::nullopt);
     EXPECT_EQ(asked.rate, 2'000'000);
