@@ -28,7 +28,7 @@ bool BesideTrack::Next(int64_t until, bool closing, Item& item) {
     return found;
 }
 
-BesideSound::BesideSound(const MovieReader& reader, const AVStream& stream, const SoundStreamInfo& sound,
+BesideSound::BesideSound(const PacketReader& reader, const AVStream& stream, const SoundStreamInfo& sound,
                          Demuxer& demuxer, const BesideBounds& bounds, Failures& failures)
     : BesideTrack(bounds, failures),
       demuxer_(demuxer),

@@ -64,7 +64,7 @@ private:
 class BesideSound final : public BesideTrack {
 public:
     /// Throws SourceError.
-    BesideSound(const MovieReader& reader, const AVStream& stream, const SoundStreamInfo& sound,
+    BesideSound(const PacketReader& reader, const AVStream& stream, const SoundStreamInfo& sound,
                 Demuxer& demuxer, const BesideBounds& bounds, Failures& failures);
 
     const AudioFormat& Format() const { return decoder_.Format(); }

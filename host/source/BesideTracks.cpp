@@ -109,7 +109,7 @@ std::vector<av::Packet> BesideTracks::CuesBefore(int stream) {
             if (each.kind == StreamKind::kSubtitles)
                 subtitles.push_back(each.index);
         const int main = info.pictures ? info.pictures->index : info.sound->index;
-        MovieReader again(info.path, choice_.playlists, Growth::kRead, source_.Reader().Interruptible());
+        PacketReader again(info.path, choice_.playlists, Growth::kRead, source_.Reader().Interruptible());
         earlierCues_ = ReadEarlierCues(again, main, std::move(subtitles), bounds_.begin);
     }
     return std::move(earlierCues_.packets[stream]);

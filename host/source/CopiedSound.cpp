@@ -72,7 +72,7 @@ void CopiedSound::VorbisParserFree::operator()(AVVorbisParseContext* parser) con
     av_vorbis_parse_free(&parser);
 }
 
-CopiedSound::CopiedSound(const MovieReader& reader, const AVStream& stream, Demuxer& demuxer,
+CopiedSound::CopiedSound(const PacketReader& reader, const AVStream& stream, Demuxer& demuxer,
                          const BesideBounds& bounds, Failures& failures)
     : BesideTrack(bounds, failures),
       reader_(reader),

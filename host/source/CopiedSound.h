@@ -19,7 +19,7 @@ namespace movieconv {
 /// behind each other, as long as the source's stamps do not tell of a gap.
 class CopiedSound final : public BesideTrack {
 public:
-    CopiedSound(const MovieReader& reader, const AVStream& stream, Demuxer& demuxer,
+    CopiedSound(const PacketReader& reader, const AVStream& stream, Demuxer& demuxer,
                 const BesideBounds& bounds, Failures& failures);
     ~CopiedSound() override;
 
@@ -49,7 +49,7 @@ private:
     int64_t SamplesAt(int64_t time) const;
     int64_t TimeOf(int64_t samples) const;
 
-    const MovieReader& reader_;
+    const PacketReader& reader_;
     Demuxer& demuxer_;
     const int stream_;
     const AVRational timeBase_;

@@ -26,7 +26,7 @@ constexpr int kMostPackets = 200; // from a key picture to what comes out of the
 constexpr char kDetector[] = "cropdetect=limit=0.094:round=2:skip=0:reset=0";
 
 /// The first picture from the key picture at or before `seconds`; null when there is none.
-av::Frame LookAt(MovieReader& reader, int stream, double seconds) {
+av::Frame LookAt(PacketReader& reader, int stream, double seconds) {
     AVFormatContext* context = reader.Context();
     const int64_t start = context->start_time != AV_NOPTS_VALUE ? context->start_time : 0;
     const int64_t target = start + std::llround(seconds * AV_TIME_BASE);

@@ -31,7 +31,7 @@ void Add(CueList& list, av::Packet packet, int64_t begin, int64_t duration) {
 }
 
 /// False for one that begins at `end` or later.
-bool AddUntil(int64_t end, CueList& list, const MovieReader& reader, av::Packet packet) {
+bool AddUntil(int64_t end, CueList& list, const PacketReader& reader, av::Packet packet) {
     const AVRational unit = reader.Context()->streams[packet->stream_index]->time_base;
     const int64_t stamp = StampOf(*packet);
     if (stamp == AV_NOPTS_VALUE)
@@ -48,7 +48,7 @@ bool AddUntil(int64_t end, CueList& list, const MovieReader& reader, av::Packet 
 
 void ReadStream(CueList& list, const Source& source, const BurnWish& wish, bool playlists) {
     const int stream = WantedTracks(source.Info().streams, StreamKind::kSubtitles, {{wish.what}}).front();
-    MovieReader reader(source.Info().path, playlists, Growth::kRead, source.Reader().Interruptible());
+    PacketReader reader(source.Info().path, playlists, Growth::kRead, source.Reader().Interruptible());
     if (!reader.IsSeekable())
         throw TrackError(Say("the subtitles of a pipe cannot be drawn into its pictures"));
     AVFormatContext* context = reader.Context();

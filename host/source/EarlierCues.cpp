@@ -15,13 +15,13 @@ namespace movieconv {
 namespace {
 
 /// Whether an index leads to each packet, so that those of one stream can be read without the others.
-bool HasWholeIndex(const MovieReader& file) {
+bool HasWholeIndex(const PacketReader& file) {
     return av_match_name("mov", file.Context()->iformat->name) != 0;
 }
 
 } // namespace
 
-int64_t EarliestCueFor(const MovieReader& file, int64_t begin) {
+int64_t EarliestCueFor(const PacketReader& file, int64_t begin) {
     constexpr double kMostBytes = 1 << 30;
     constexpr int64_t kLeast = 60 * kTicksPerSecond;
     const int64_t near = std::max<int64_t>(begin - kLeast, 0);
@@ -45,7 +45,7 @@ Sentence TellEarliestCue(int64_t earliest, int64_t begin) {
         ToSeconds(begin - earliest));
 }
 
-bool SeekToCues(MovieReader& file, int64_t earliest) {
+bool SeekToCues(PacketReader& file, int64_t earliest) {
     if (earliest <= 0)
         return true;
     const int64_t from = file.Start() + earliest;
@@ -53,7 +53,7 @@ bool SeekToCues(MovieReader& file, int64_t earliest) {
     return avformat_seek_file(file.Context(), -1, INT64_MIN, target, target, 0) >= 0;
 }
 
-EarlierCues ReadEarlierCues(MovieReader& file, int main, std::vector<int> streams, int64_t begin) {
+EarlierCues ReadEarlierCues(PacketReader& file, int main, std::vector<int> streams, int64_t begin) {
     EarlierCues found;
     if (!file.IsSeekable())
         return found;

@@ -3,7 +3,7 @@
 #define MOVIECONV_HOST_SOURCE_EARLIERCUES_H
 
 #include "host/sentence/Sentence.h"
-#include "host/source/MovieReader.h"
+#include "host/source/PacketReader.h"
 
 #include <cstdint>
 #include <map>
@@ -13,14 +13,14 @@ namespace movieconv {
 
 /// Since when they have to have begun to be found (media time): all, as far as reading them takes seconds,
 /// those of the last minute in any case.
-int64_t EarliestCueFor(const MovieReader& file, int64_t begin);
+int64_t EarliestCueFor(const PacketReader& file, int64_t begin);
 
 /// Tells what was not looked for; empty where `earliest` is the source's start.
 Sentence TellEarliestCue(int64_t earliest, int64_t begin);
 
-/// Goes to where all that begins at `earliest` or later is still to be read; stays where it is for the source's
-/// start. False when the source cannot be sought there: where it is then is not known.
-bool SeekToCues(MovieReader& file, int64_t earliest);
+/// Goes to where all that begins at `earliest` or later is still to be read; stays where it is for the
+/// source's start. False when the source cannot be sought there: where it is then is not known.
+bool SeekToCues(PacketReader& file, int64_t earliest);
 
 struct EarlierCues {
     std::map<int, std::vector<av::Packet>> packets; ///< By stream.
@@ -29,7 +29,7 @@ struct EarlierCues {
 
 /// Where pictures can be decoded from, containers give none of them. `main` is the stream that tells how far
 /// reading is, `file` has just been opened. None when it cannot be sought.
-EarlierCues ReadEarlierCues(MovieReader& file, int main, std::vector<int> streams, int64_t begin);
+EarlierCues ReadEarlierCues(PacketReader& file, int main, std::vector<int> streams, int64_t begin);
 
 } // namespace movieconv
 

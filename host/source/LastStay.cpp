@@ -27,7 +27,7 @@ void LastStay::Add(const AVPacket& packet) {
     latest_ = times;
 }
 
-std::optional<StampRepair::Stamp> LastStay::Told(const MovieReader& reader, AVRational timeBase) const {
+std::optional<StampRepair::Stamp> LastStay::Told(const PacketReader& reader, AVRational timeBase) const {
     if (!last_ || last_->shown == AV_NOPTS_VALUE || latest_.shown == AV_NOPTS_VALUE)
         return std::nullopt;
     // Some containers know only how long it is until the next picture is decoded. There the one decoded last

@@ -2,7 +2,7 @@
 #ifndef MOVIECONV_HOST_SOURCE_LASTSTAY_H
 #define MOVIECONV_HOST_SOURCE_LASTSTAY_H
 
-#include "host/source/MovieReader.h"
+#include "host/source/PacketReader.h"
 #include "host/source/StampRepair.h"
 
 #include <cstdint>
@@ -17,7 +17,7 @@ public:
     void Add(const AVPacket& packet);
 
     /// The stamp of the picture that is shown last; nothing where it is not told how long it stays.
-    std::optional<StampRepair::Stamp> Told(const MovieReader& reader, AVRational timeBase) const;
+    std::optional<StampRepair::Stamp> Told(const PacketReader& reader, AVRational timeBase) const;
 
 private:
     /// Of a packet, in the stream's unit.

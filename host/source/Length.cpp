@@ -23,7 +23,7 @@ bool AnnouncesItsEnd(const AVInputFormat& format) {
 }
 
 /// 0 when the container announces none.
-double AnnouncedLength(const MovieReader& reader) {
+double AnnouncedLength(const PacketReader& reader) {
     const AVFormatContext& context = *reader.Context();
     if (context.duration <= 0)
         return 0;
@@ -32,12 +32,12 @@ double AnnouncedLength(const MovieReader& reader) {
 }
 
 /// Whether places in the file can be sought by their bytes.
-bool SeeksByBytes(const MovieReader& reader) {
+bool SeeksByBytes(const PacketReader& reader) {
     return (reader.Context()->iformat->flags & AVFMT_NO_BYTE_SEEK) == 0;
 }
 
 /// The last part of the file; an empty one where it cannot be sought.
-Stretch ReadTail(MovieReader& reader, const SourceInfo& info) {
+Stretch ReadTail(PacketReader& reader, const SourceInfo& info) {
     const int64_t target = std::max<int64_t>(info.bytes - kStretchBytes, 0);
     const int sought =
         SeeksByBytes(reader)
@@ -47,7 +47,7 @@ Stretch ReadTail(MovieReader& reader, const SourceInfo& info) {
 }
 
 /// Seconds, by the file's size and by how long its first and last packets last; 0 when these do not tell.
-double EstimateLength(MovieReader& reader, const SourceInfo& info, const Stretch& tail) {
+double EstimateLength(PacketReader& reader, const SourceInfo& info, const Stretch& tail) {
     const Stretch head = ReadStretch(reader, Counted(info), kStretchBytes);
     ReturnToBegin(reader, info);
     const auto span = [](const Stretch& part) {
@@ -61,7 +61,7 @@ double EstimateLength(MovieReader& reader, const SourceInfo& info, const Stretch
 
 /// By reading the end of the file, and its beginning too where the stamps are counted from wherever reading
 /// starts.
-Length MeasureLength(MovieReader& reader, const SourceInfo& info, double announced) {
+Length MeasureLength(PacketReader& reader, const SourceInfo& info, double announced) {
     Stretch tail;
     bool countsOn = true;
     if (reader.IsSeekable()) {
@@ -80,7 +80,7 @@ Length MeasureLength(MovieReader& reader, const SourceInfo& info, double announc
 }
 
 /// Whether stamps fall from one of some places in the file to the next.
-bool FallsSomewhere(MovieReader& reader, const SourceInfo& info, double last) {
+bool FallsSomewhere(PacketReader& reader, const SourceInfo& info, double last) {
     constexpr int64_t kPlaces = 16;
     constexpr int64_t kSampleBytes = 256 << 10;
     constexpr double kMostFall = 0.5; // pictures that build on later ones
@@ -103,7 +103,7 @@ bool FallsSomewhere(MovieReader& reader, const SourceInfo& info, double last) {
 
 /// Where the clock may start anew, the last stamp says little: files that were joined seem to last for hours,
 /// or as long as one of them. There the length is by the size.
-Length DoubtLength(MovieReader& reader, const SourceInfo& info, double announced) {
+Length DoubtLength(PacketReader& reader, const SourceInfo& info, double announced) {
     Length length{announced, Certainty::kKnown, true};
     if ((reader.Context()->iformat->flags & AVFMT_TS_DISCONT) == 0 || !reader.IsSeekable() ||
         reader.File().IsPlaylist())
@@ -120,7 +120,7 @@ Length DoubtLength(MovieReader& reader, const SourceInfo& info, double announced
 
 } // namespace
 
-Length FindLength(MovieReader& reader, const SourceInfo& info) {
+Length FindLength(PacketReader& reader, const SourceInfo& info) {
     const AVFormatContext& context = *reader.Context();
     const double announced = AnnouncedLength(reader);
     // ASF has its length from whoever wrote it, who may have taken the last stamp for it.

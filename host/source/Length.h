@@ -2,7 +2,7 @@
 #ifndef MOVIECONV_HOST_SOURCE_LENGTH_H
 #define MOVIECONV_HOST_SOURCE_LENGTH_H
 
-#include "host/source/MovieReader.h"
+#include "host/source/PacketReader.h"
 #include "host/source/SourceInfo.h"
 
 namespace movieconv {
@@ -16,7 +16,7 @@ struct Length {
 
 /// Reads parts of the source where the container tells no length, or one to doubt. `info` describes the
 /// chosen streams. The source is at its begin before and after. Throws SourceError.
-Length FindLength(MovieReader& reader, const SourceInfo& info);
+Length FindLength(PacketReader& reader, const SourceInfo& info);
 
 } // namespace movieconv
 

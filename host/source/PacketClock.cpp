@@ -30,7 +30,7 @@ std::vector<int> WitnessesIn(const SourceInfo& info, const AVFormatContext& cont
 
 } // namespace
 
-PacketClock::PacketClock(const SourceInfo& info, const MovieReader& reader)
+PacketClock::PacketClock(const SourceInfo& info, const PacketReader& reader)
     : reader_(reader), witnesses_(WitnessesIn(info, *reader.Context())) {}
 
 void PacketClock::Push(av::Packet packet) {

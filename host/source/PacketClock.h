@@ -4,7 +4,7 @@
 
 #include "ffmpeg/AvHandles.h"
 #include "host/source/ClockRepair.h"
-#include "host/source/MovieReader.h"
+#include "host/source/PacketReader.h"
 #include "host/source/SourceInfo.h"
 
 #include <atomic>
@@ -16,7 +16,7 @@ namespace movieconv {
 /// For one reader of the source. What it reads from the start on gets the same stamps as by any other one.
 class PacketClock {
 public:
-    PacketClock(const SourceInfo& info, const MovieReader& reader);
+    PacketClock(const SourceInfo& info, const PacketReader& reader);
 
     /// The streams by which jumps are found: all pictures and sound on the clock of what is converted, taken
     /// or not. They have to be read; none where no jumps are to be expected.
@@ -33,7 +33,7 @@ public:
     int Jumps() const { return jumps_; }
 
 private:
-    const MovieReader& reader_;
+    const PacketReader& reader_;
     const std::vector<int> witnesses_;
     ClockRepair repair_;
     std::deque<av::Packet> waiting_;

@@ -29,7 +29,7 @@ void CopyLayout(AVChannelLayout& target, const AVChannelLayout& source,
 
 } // namespace
 
-PcmDecoder::PcmDecoder(const MovieReader& reader, const AVStream& stream, const SoundStreamInfo& sound,
+PcmDecoder::PcmDecoder(const PacketReader& reader, const AVStream& stream, const SoundStreamInfo& sound,
                        Sink sink)
     : reader_(reader),
       sink_(std::move(sink)),

@@ -2,7 +2,7 @@
 #ifndef MOVIECONV_HOST_SOURCE_PCMDECODER_H
 #define MOVIECONV_HOST_SOURCE_PCMDECODER_H
 
-#include "host/source/MovieReader.h"
+#include "host/source/PacketReader.h"
 #include "host/source/SoundTimeline.h"
 #include "host/source/SourceInfo.h"
 #include "host/source/StreamDecoder.h"
@@ -27,7 +27,7 @@ public:
     };
 
     /// `reader` outlives it, `stream` is read here only. Throws SourceError.
-    PcmDecoder(const MovieReader& reader, const AVStream& stream, const SoundStreamInfo& sound, Sink sink);
+    PcmDecoder(const PacketReader& reader, const AVStream& stream, const SoundStreamInfo& sound, Sink sink);
 
     const AudioFormat& Format() const { return format_; }
     int64_t FrameBytes() const { return frameBytes_; }
@@ -58,7 +58,7 @@ private:
     bool PushDoubted(std::optional<int64_t> witness);
     bool Push(std::optional<int64_t> stamp, const Chunk& chunk, std::optional<int64_t> witness);
 
-    const MovieReader& reader_;
+    const PacketReader& reader_;
     const Sink sink_;
     const AVRational timeBase_;
     AudioFormat format_{};

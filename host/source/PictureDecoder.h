@@ -84,7 +84,7 @@ private:
     bool UseMoreThreads(const std::vector<av::Packet>& known);
     bool Advance();
 
-    const MovieReader& reader_;
+    const PacketReader& reader_;
     Demuxer& demuxer_;
     Failures& failures_;
     const int stream_;

@@ -50,7 +50,7 @@ private:
     std::optional<int64_t> NextShown();
     bool IsShown(const AVPacket& packet);
 
-    const MovieReader& reader_;
+    const PacketReader& reader_;
     Demuxer& demuxer_;
     const int stream_;
     const AVRational timeBase_;

@@ -44,12 +44,12 @@ double TaggedEnd(const AVStream* stream, double start) {
                : 0;
 }
 
-bool IsMov(const MovieReader& reader) {
+bool IsMov(const PacketReader& reader) {
     return av_match_name("mov", reader.Context()->iformat->name) != 0;
 }
 
 /// The first pictures; an empty stretch where they could not be read once more.
-Stretch ReadPictures(MovieReader& reader, const SourceInfo& info) {
+Stretch ReadPictures(PacketReader& reader, const SourceInfo& info) {
     if (!reader.IsSeekable())
         return {};
     AVStream* sound = info.sound ? reader.Context()->streams[info.sound->index] : nullptr;
@@ -64,7 +64,7 @@ Stretch ReadPictures(MovieReader& reader, const SourceInfo& info) {
 
 /// Pictures per second by the container's index, or by the stamps of the first ones; 0 when neither can be
 /// read.
-double CountFrameRate(MovieReader& reader, const SourceInfo& info) {
+double CountFrameRate(PacketReader& reader, const SourceInfo& info) {
     const AVStream* stream = reader.Context()->streams[info.pictures->index];
     if (IsMov(reader) && stream->nb_frames > 1 && stream->duration > 0) {
         const double indexed = static_cast<double>(stream->nb_frames) /
@@ -78,7 +78,7 @@ double CountFrameRate(MovieReader& reader, const SourceInfo& info) {
 }
 
 /// In seconds: of all pictures where the container has an index of them, else of the first ones.
-std::vector<double> StampsOfPictures(MovieReader& reader, const SourceInfo& info) {
+std::vector<double> StampsOfPictures(PacketReader& reader, const SourceInfo& info) {
     AVStream* stream = reader.Context()->streams[info.pictures->index];
     const int indexed = IsMov(reader) ? avformat_index_get_entries_count(stream) : 0;
     if (indexed < 2)
@@ -91,7 +91,7 @@ std::vector<double> StampsOfPictures(MovieReader& reader, const SourceInfo& info
 }
 
 /// Pictures per second where they follow each other closest; 0 when that cannot be read.
-double MeasurePeakRate(MovieReader& reader, const SourceInfo& info) {
+double MeasurePeakRate(PacketReader& reader, const SourceInfo& info) {
     std::vector<double> stamps = StampsOfPictures(reader, info);
     std::sort(stamps.begin(), stamps.end());
     double peak = 0;
@@ -111,7 +111,7 @@ bool OthersMayBeLonger(const SourceInfo& info) {
 }
 
 /// Takes down what the container announces about the streams that are converted.
-void FindPromise(const MovieReader& reader, const Length& length, SourceInfo& info) {
+void FindPromise(const PacketReader& reader, const Length& length, SourceInfo& info) {
     const AVFormatContext& context = *reader.Context();
     Promise& promise = info.promise;
     promise.cutOff = reader.File().IsCutOff();
@@ -143,7 +143,7 @@ void FindPromise(const MovieReader& reader, const Length& length, SourceInfo& in
 } // namespace
 
 /// Counts the first pictures where the container tells no usual rate, and settles the highest one.
-void ProbeFrameRate(MovieReader& reader, SourceInfo& info) {
+void ProbeFrameRate(PacketReader& reader, SourceInfo& info) {
     PictureStreamInfo& pictures = *info.pictures;
     const double counted = pictures.frameRate <= 0 ? CountFrameRate(reader, info) : 0;
     const AVStream* stream = reader.Context()->streams[pictures.index];
@@ -161,7 +161,7 @@ void ProbeFrameRate(MovieReader& reader, SourceInfo& info) {
     }
 }
 
-void ProbeLight(MovieReader& reader, SourceInfo& info) {
+void ProbeLight(PacketReader& reader, SourceInfo& info) {
     constexpr int kMostPackets = 100; // until the first picture comes out
     PictureStreamInfo& pictures = *info.pictures;
     if (!IsHdr(pictures) || (pictures.masteringDisplay && pictures.lightLevel) || !reader.IsSeekable())
@@ -193,7 +193,7 @@ void ProbeLight(MovieReader& reader, SourceInfo& info) {
     ReturnToBegin(reader, info);
 }
 
-void ProbeLength(MovieReader& reader, SourceInfo& info) {
+void ProbeLength(PacketReader& reader, SourceInfo& info) {
     const Length length = FindLength(reader, info);
     info.certainty = length.certainty;
     info.clockRestarts = length.clockRestarts;

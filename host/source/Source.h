@@ -2,7 +2,7 @@
 #ifndef MOVIECONV_HOST_SOURCE_SOURCE_H
 #define MOVIECONV_HOST_SOURCE_SOURCE_H
 
-#include "host/source/MovieReader.h"
+#include "host/source/PacketReader.h"
 #include "host/source/SourceError.h"
 #include "host/source/SourceInfo.h"
 
@@ -22,8 +22,8 @@ public:
     Source& operator=(const Source&) = delete;
 
     const SourceInfo& Info() const { return info_; }
-    MovieReader& Reader() { return reader_; }
-    const MovieReader& Reader() const { return reader_; }
+    PacketReader& Reader() { return reader_; }
+    const PacketReader& Reader() const { return reader_; }
 
     /// The content of a cover or an attachment; empty for other streams.
     std::vector<uint8_t> StoredFile(int stream) const;
@@ -41,7 +41,7 @@ private:
     void CropPictures(const Crop& crop);
     StreamInfo& StreamOf(int index);
 
-    MovieReader reader_;
+    PacketReader reader_;
     SourceInfo info_;
 };
 

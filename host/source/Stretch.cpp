@@ -15,7 +15,7 @@ int Counted(const SourceInfo& info) {
     return info.pictures ? info.pictures->index : info.sound->index;
 }
 
-Stretch ReadStretch(MovieReader& reader, int counted, int64_t mostBytes, int mostPackets) {
+Stretch ReadStretch(PacketReader& reader, int counted, int64_t mostBytes, int mostPackets) {
     AVFormatContext* context = reader.Context();
     std::vector<av::CodecParameters> beginnings;
     for (unsigned i = 0; i < context->nb_streams; ++i)
@@ -51,7 +51,7 @@ Stretch ReadStretch(MovieReader& reader, int counted, int64_t mostBytes, int mos
     return stretch;
 }
 
-void ReturnToBegin(MovieReader& reader, const SourceInfo& info) {
+void ReturnToBegin(PacketReader& reader, const SourceInfo& info) {
     if (!reader.Rewind())
         throw SourceError(Say("cannot read \"{}\" from its start again", info.path));
 }

@@ -2,7 +2,7 @@
 #ifndef MOVIECONV_HOST_SOURCE_STRETCH_H
 #define MOVIECONV_HOST_SOURCE_STRETCH_H
 
-#include "host/source/MovieReader.h"
+#include "host/source/PacketReader.h"
 #include "host/source/SourceInfo.h"
 
 #include <cstdint>
@@ -31,11 +31,11 @@ int Counted(const SourceInfo& info);
 
 /// Reads to the end, or until it has so many bytes or packets of the stream that is counted. That may
 /// describe the streams anew, as they are there; for the decoders they are as at the beginning.
-Stretch ReadStretch(MovieReader& reader, int counted, int64_t mostBytes,
+Stretch ReadStretch(PacketReader& reader, int counted, int64_t mostBytes,
                     int mostPackets = std::numeric_limits<int>::max());
 
 /// Throws SourceError.
-void ReturnToBegin(MovieReader& reader, const SourceInfo& info);
+void ReturnToBegin(PacketReader& reader, const SourceInfo& info);
 
 } // namespace movieconv
 

@@ -1,6 +1,6 @@
 // The decoders against real movies, whole, damaged and odd, called as the engine calls them.
 #include "host/source/Movie.h"
-#include "host/source/MovieReader.h"
+#include "host/source/PacketReader.h"
 #include "host/source/StreamDecoder.h"
 #include "tests/support/Inspect.h"
 #include "tests/support/TestMovies.h"
@@ -230,8 +230,8 @@ TEST(Decoders, GiveWhatIsWholeBehindDamageAtTheEnd) {
     const std::string path = Make("noise-end.mp4", {"-f", "lavfi", "-i", "testsrc2=s=320x240:r=25:d=1", "-vf",
                                                     "noise=alls=60:allf=t", "-c:v", "libx264", "-qp", "10",
                                                     "-bf", "0", "-g", "1000", "-x264-params", "slices=1"});
-    movieconv::MovieReader reader(path, false, movieconv::Growth::kRead,
-                                  std::make_shared<movieconv::Interruption>());
+    movieconv::PacketReader reader(path, false, movieconv::Growth::kRead,
+                                   std::make_shared<movieconv::Interruption>());
     const AVStream& stream = *reader.Context()->streams[0];
     movieconv::StreamDecoder decoder(*stream.codecpar, stream.time_base, 4);
     int pictures = 0;

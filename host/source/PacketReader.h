@@ -1,7 +1,7 @@
 // Reads a movie's packets: the streams that are wanted, on the movie's clock, from its start again if need
 // be.
-#ifndef MOVIECONV_HOST_SOURCE_MOVIEREADER_H
-#define MOVIECONV_HOST_SOURCE_MOVIEREADER_H
+#ifndef MOVIECONV_HOST_SOURCE_PACKETREADER_H
+#define MOVIECONV_HOST_SOURCE_PACKETREADER_H
 
 #include "ffmpeg/AvHandles.h"
 #include "host/source/MovieFile.h"
@@ -14,11 +14,11 @@
 namespace movieconv {
 
 /// One thread at a time reads; Interrupt may be called from any.
-class MovieReader {
+class PacketReader {
 public:
     /// Opens as MovieFile does. Throws SourceError.
-    MovieReader(const std::string& path, bool playlists, Growth growth,
-                std::shared_ptr<Interruption> interruption);
+    PacketReader(const std::string& path, bool playlists, Growth growth,
+                 std::shared_ptr<Interruption> interruption);
 
     /// Streams are the context's only until Rewind or Reopen, their numbers stay.
     AVFormatContext* Context() const { return file_->Context(); }

@@ -1,4 +1,4 @@
-#include "host/source/MovieReader.h"
+#include "host/source/PacketReader.h"
 
 #include "host/sentence/Say.h"
 #include "host/source/MediaTime.h"
@@ -19,8 +19,8 @@ int64_t WithinReason(int64_t mediaTime) {
 
 } // namespace
 
-MovieReader::MovieReader(const std::string& path, bool playlists, Growth growth,
-                         std::shared_ptr<Interruption> interruption)
+PacketReader::PacketReader(const std::string& path, bool playlists, Growth growth,
+                           std::shared_ptr<Interruption> interruption)
     : path_(path),
       playlists_(playlists),
       growth_(growth),
@@ -30,17 +30,17 @@ MovieReader::MovieReader(const std::string& path, bool playlists, Growth growth,
         start_ = WithinReason(av_rescale_q(start, {1, AV_TIME_BASE}, {1, kTicksPerSecond}));
 }
 
-void MovieReader::Select(std::vector<int> streams) {
+void PacketReader::Select(std::vector<int> streams) {
     selected_ = std::move(streams);
     DiscardOthers();
 }
 
-void MovieReader::SelectBeside(std::vector<int> streams) {
+void PacketReader::SelectBeside(std::vector<int> streams) {
     beside_ = std::move(streams);
     DiscardOthers();
 }
 
-void MovieReader::DiscardOthers() {
+void PacketReader::DiscardOthers() {
     for (unsigned i = 0; i < Context()->nb_streams; ++i) {
         const bool wanted = std::count(selected_.begin(), selected_.end(), static_cast<int>(i)) > 0 ||
                             std::count(beside_.begin(), beside_.end(), static_cast<int>(i)) > 0;
@@ -48,15 +48,15 @@ void MovieReader::DiscardOthers() {
     }
 }
 
-int64_t MovieReader::MediaTime(int64_t stamp, AVRational timeBase) const {
+int64_t PacketReader::MediaTime(int64_t stamp, AVRational timeBase) const {
     return WithinReason(av_rescale_q(stamp, timeBase, {1, kTicksPerSecond})) - start_;
 }
 
-bool MovieReader::IsSeekable() const {
+bool PacketReader::IsSeekable() const {
     return Context()->pb != nullptr && (Context()->pb->seekable & AVIO_SEEKABLE_NORMAL) != 0;
 }
 
-bool MovieReader::Rewind() {
+bool PacketReader::Rewind() {
     if (file_->IsPlaylist()) { // whose demultiplexer may find nothing more after a seek, and tells success
         try {
             Reopen();
@@ -97,7 +97,7 @@ bool MovieReader::Rewind() {
     return avformat_seek_file(Context(), first->index, INT64_MIN, earlier, start, 0) >= 0 || toFirstByte();
 }
 
-void MovieReader::Reopen() {
+void PacketReader::Reopen() {
     auto again = std::make_unique<MovieFile>(path_, playlists_, growth_, interruption_);
     int last = -1;
     for (const std::vector<int>* streams : {&selected_, &beside_})
