@@ -109,14 +109,15 @@ Cover MakeCover(const void* data, int64_t size) {
 
 Extras ExtrasWithin(Extras extras, int64_t begin, double seconds) {
     const int64_t length = std::llround(seconds * kTicksPerSecond);
-    for (const Chapter& chapter : std::exchange(extras.chapters, {})) {
+    for (const OutputChapter& chapter : std::exchange(extras.chapters, {})) {
         const int64_t from = std::max<int64_t>(0, chapter.begin - begin);
         const int64_t to = std::min(length, chapter.end - begin);
         if (to - from >= kWriterShortestChapter)
             extras.chapters.push_back({from, to, chapter.title});
     }
-    std::stable_sort(extras.chapters.begin(), extras.chapters.end(),
-                     [](const Chapter& one, const Chapter& other) { return one.begin < other.begin; });
+    std::stable_sort(
+        extras.chapters.begin(), extras.chapters.end(),
+        [](const OutputChapter& one, const OutputChapter& other) { return one.begin < other.begin; });
     return extras;
 }
 

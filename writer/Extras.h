@@ -17,7 +17,7 @@ namespace writer {
 using Tags = std::map<std::string, std::string>;
 using Bytes = std::shared_ptr<const std::vector<uint8_t>>;
 
-struct Chapter {
+struct OutputChapter {
     int64_t begin; ///< 100 ns units.
     int64_t end;
     std::string title;
@@ -76,7 +76,7 @@ struct Extras {
     TrackLabel pictures;
     TrackLabel sound;
     std::vector<Track> tracks;
-    std::vector<Chapter> chapters; ///< In the source's time, or in the file's.
+    std::vector<OutputChapter> chapters; ///< In the source's time, or in the file's.
     Cover cover;
     std::vector<Attachment> attachments;
 };

@@ -45,7 +45,7 @@ Tags TagsFor(const Container& container, Tags tags) {
 }
 
 /// MP4 has 16 bits for the length of a text; the multiplexer takes the rest of a longer one.
-std::string TitleFor(const Container& container, const Chapter& chapter) {
+std::string TitleFor(const Container& container, const OutputChapter& chapter) {
     constexpr size_t kMost = 65535;
     if (container.kind != ContainerKind::kFragmented || chapter.title.size() <= kMost)
         return chapter.title;
@@ -156,11 +156,11 @@ int ExtrasMuxer::WriteCover(AVFormatContext& output) const {
     return av_write_frame(&output, cover.get());
 }
 
-void ExtrasMuxer::SetChapters(AVFormatContext& output, const std::vector<Chapter>& chapters) const {
+void ExtrasMuxer::SetChapters(AVFormatContext& output, const std::vector<OutputChapter>& chapters) const {
     if (!Carries(kWriterFormatChapters) || fragmented_ || chapters.empty())
         return;
     output.chapters = New<AVChapter*>(chapters.size());
-    for (const Chapter& chapter : chapters) {
+    for (const OutputChapter& chapter : chapters) {
         auto* made = New<AVChapter>();
         output.chapters[output.nb_chapters++] = made;
         made->id = output.nb_chapters;

@@ -28,7 +28,7 @@ public:
     int WriteCover(AVFormatContext& output) const;
 
     /// On the file's timeline, before its end.
-    void SetChapters(AVFormatContext& output, const std::vector<Chapter>& chapters) const;
+    void SetChapters(AVFormatContext& output, const std::vector<OutputChapter>& chapters) const;
 
     /// Whether languages have a place for a tag beside their code.
     bool IsMatroska() const;

@@ -105,7 +105,7 @@ int64_t Mp4Index::MostTexts(const Extras& extras) {
     const auto ends =
         static_cast<int64_t>(extras.tracks.size()) * kPerText + (HasTimecode(extras) ? kHead : 0);
     return std::accumulate(extras.chapters.begin(), extras.chapters.end(), ends,
-                           [](int64_t sum, const Chapter& chapter) {
+                           [](int64_t sum, const OutputChapter& chapter) {
                                return sum + kPerText + static_cast<int64_t>(chapter.title.size());
                            });
 }

@@ -139,7 +139,7 @@ void Muxer::SetOptions(int64_t room) {
     }
 }
 
-void Muxer::SetChapters(const std::vector<Chapter>& chapters) {
+void Muxer::SetChapters(const std::vector<OutputChapter>& chapters) {
     extras_.SetChapters(*output_, chapters);
 }
 

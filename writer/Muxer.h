@@ -42,7 +42,7 @@ public:
     void WriteHeader(int64_t room) override;
 
     /// Chapters on the file's timeline, before its end; where it is fragmented, it takes none.
-    void SetChapters(const std::vector<Chapter>& chapters) override;
+    void SetChapters(const std::vector<OutputChapter>& chapters) override;
 
     /// Takes the packet's content. Times are in the stream's unit; those of decoding must not fall.
     void Write(AVPacket& packet, int stream) override;

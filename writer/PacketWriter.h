@@ -50,7 +50,7 @@ public:
     virtual void WriteHeader(int64_t room) = 0;
 
     /// Chapters on the file's timeline, before its end.
-    virtual void SetChapters(const std::vector<Chapter>& chapters) = 0;
+    virtual void SetChapters(const std::vector<OutputChapter>& chapters) = 0;
 
     /// Takes the packet's content. Times are in the stream's unit; those of decoding must not fall.
     virtual void Write(AVPacket& packet, int stream) = 0;

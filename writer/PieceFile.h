@@ -32,7 +32,7 @@ public:
 
     int AddStream(const MuxedStream& stream) override;
     void WriteHeader(int64_t room) override;
-    void SetChapters(const std::vector<Chapter>&) override {} // the joined file gets them
+    void SetChapters(const std::vector<OutputChapter>&) override {} // the joined file gets them
     void Write(AVPacket& packet, int stream) override;
     void WriteTrailer() override;
     Written Stream(int stream) const override;
