@@ -154,37 +154,38 @@ Crew::Mood Batch::HowToGoOn() const {
 /// Puts what is to be converted in its order.
 void Batch::List() {
     const std::string extension = ExtensionFor(order_.request);
-    std::vector<Movie> movies;
+    std::vector<Candidate> candidates;
     for (const std::string& input : order_.inputs) {
         std::error_code error;
         if (!fs::is_directory(input, error)) {
-            movies.push_back({input, OutputFor(input, extension), true});
+            candidates.push_back({input, OutputFor(input, extension), true});
             continue;
         }
         if (fs::equivalent(input, order_.folder, error))
             throw Failure(Category::kRequest,
                           fmt::format("\"{}\" is where the outputs go; choose another folder", input));
         for (const std::string& file : FilesIn(input))
-            movies.push_back({file, OutputFor(file, extension), false});
+            candidates.push_back({file, OutputFor(file, extension), false});
     }
-    for (const Movie& movie : movies)
-        NoteSource(movie.input);
-    RequireOwnOutputs(movies);
-    waiting_.assign(movies.begin(), movies.end());
+    for (const Candidate& candidate : candidates)
+        NoteSource(candidate.input);
+    RequireOwnOutputs(candidates);
+    waiting_.assign(candidates.begin(), candidates.end());
 }
 
 /// Throws Failure when two would become the same file. What is no movie, and only stands in the same folder,
 /// takes no name from one.
-void Batch::RequireOwnOutputs(const std::vector<Movie>& movies) {
-    std::map<std::string, std::vector<const Movie*>> takers;
-    for (const Movie& movie : movies)
-        takers[TargetOf(movie.output)].push_back(&movie);
+void Batch::RequireOwnOutputs(const std::vector<Candidate>& candidates) {
+    std::map<std::string, std::vector<const Candidate*>> takers;
+    for (const Candidate& candidate : candidates)
+        takers[TargetOf(candidate.output)].push_back(&candidate);
     for (auto& [target, those] : takers) {
         if (those.size() == 1)
             continue;
         those.erase(std::remove_if(those.begin(), those.end(),
-                                   [this](const Movie* movie) {
-                                       return !movie->named && !WhyNoMovie(RequestFor(*movie)).IsEmpty();
+                                   [this](const Candidate* candidate) {
+                                       return !candidate->named &&
+                                              !WhyNoMovie(RequestFor(*candidate)).IsEmpty();
                                    }),
                     those.end());
         if (those.size() > 1)
@@ -194,10 +195,10 @@ void Batch::RequireOwnOutputs(const std::vector<Movie>& movies) {
     }
 }
 
-Request Batch::RequestFor(const Movie& movie) const {
+Request Batch::RequestFor(const Candidate& candidate) const {
     Request request = order_.request;
-    request.input = movie.input;
-    request.output = movie.output;
+    request.input = candidate.input;
+    request.output = candidate.output;
     return request;
 }
 
@@ -224,30 +225,30 @@ std::string Batch::OutputFor(const std::string& input, const std::string& extens
 }
 
 std::optional<Crew::Assignment> Batch::Next() {
-    const Movie movie = waiting_.front();
+    const Candidate candidate = waiting_.front();
     waiting_.pop_front();
     try {
-        return Assign(movie);
+        return Assign(candidate);
     } catch (const Failure& failure) {
-        Fail(movie.input, failure);
+        Fail(candidate.input, failure);
         return std::nullopt;
     }
 }
 
 /// Nothing when it is converted already, or no movie.
-std::optional<Crew::Assignment> Batch::Assign(const Movie& movie) {
-    Request request = RequestFor(movie);
-    if (IsSource(movie.output))
+std::optional<Crew::Assignment> Batch::Assign(const Candidate& candidate) {
+    Request request = RequestFor(candidate);
+    if (IsSource(candidate.output))
         throw Failure(
             Category::kRequest,
-            fmt::format("its output \"{}\" is one of the sources; choose other names", movie.output));
-    SourceMark source = MarkOf(movie.input);
-    const BatchJournal::State state = journal_->StateOf(movie.output, source, settings_);
-    if ((!movie.named && !IsMovie(request)) || IsDone(request, state)) {
+            fmt::format("its output \"{}\" is one of the sources; choose other names", candidate.output));
+    SourceMark source = MarkOf(candidate.input);
+    const BatchJournal::State state = journal_->StateOf(candidate.output, source, settings_);
+    if ((!candidate.named && !IsMovie(request)) || IsDone(request, state)) {
         ++skipped_;
         return std::nullopt;
     }
-    RemoveUnfinished(movie.output);
+    RemoveUnfinished(candidate.output);
     request.overwrite = request.overwrite || state != BatchJournal::State::kUnknown;
     return Assignment{request, std::make_unique<MovieErrand>(News(), *journal_, opened_, request,
                                                              std::move(source), settings_)};

@@ -34,7 +34,8 @@ public:
 private:
     using FileId = std::pair<dev_t, ino_t>;
 
-    struct Movie {
+    /// A file that may be a movie, and what it would become.
+    struct Candidate {
         std::string input;
         std::string output;
         bool named; ///< By the user, not found in a folder.
@@ -48,15 +49,15 @@ private:
     void Report() override;
 
     void List();
-    void RequireOwnOutputs(const std::vector<Movie>& movies);
+    void RequireOwnOutputs(const std::vector<Candidate>& candidates);
     void NoteSource(const std::string& path);
     bool IsSource(const std::string& path) const;
     void RemoveUnfinished(const std::string& output) const;
     std::string OutputFor(const std::string& input, const std::string& extension) const;
-    std::optional<Assignment> Assign(const Movie& movie);
+    std::optional<Assignment> Assign(const Candidate& candidate);
     bool IsDone(const Request& request, BatchJournal::State state);
     bool IsMovie(const Request& request);
-    Request RequestFor(const Movie& movie) const;
+    Request RequestFor(const Candidate& candidate) const;
     void Fail(const std::string& input, const Failure& failure);
     Verdict Conclude();
 
@@ -67,7 +68,7 @@ private:
     std::atomic<int> opened_{0}; // files
 
     // The batch's own thread's.
-    std::deque<Movie> waiting_;
+    std::deque<Candidate> waiting_;
     std::set<FileId> sources_; // all that there were in the beginning
     double converted_ = 0;     // seconds, of movies that are done
     int64_t bytes_ = 0;
