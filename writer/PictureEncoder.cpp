@@ -54,6 +54,13 @@ void SetSpeed(AVCodecContext& context, const SpeedScale& scale, const PictureSet
     context.gop_size = std::max(1, static_cast<int>(std::lround(av_q2d(settings.rate) * kKeyFrameSeconds)));
 }
 
+/// Those that can choose otherwise make a key frame that was asked for one where decoding can begin.
+void SetKeyFrames(AVCodecContext& context) {
+    constexpr const char* kOption = "forced-idr";
+    if (av_opt_find(context.priv_data, kOption, nullptr, 0, 0) != nullptr)
+        SetOption(context, kOption, "1");
+}
+
 /// The rate beside a constant quality, which the upper one limits and the usual one does not.
 int64_t RateBeside(const QualityScale& scale, const PictureSettings& settings) {
     constexpr double kUncodedBits = 12; // of a pixel: what no quality needs
@@ -132,6 +139,7 @@ av::CodecContext OpenWith(const PictureCodec& codec, const PictureSettings& sett
     if (settings.light && codec.id == AV_CODEC_ID_HEVC) // which also tells it in its own stream
         SetOption(context, "x265-params", LightParameters(options, *settings.light));
     SetSpeed(context, codec.speed, settings);
+    SetKeyFrames(context);
     if (settings.profile != nullptr)
         SetOption(context, "profile", settings.profile);
     if (settings.quality)
@@ -178,6 +186,8 @@ PictureEncoder::PictureEncoder(const PictureCodec& codec, const PictureSettings&
     : ticksPerPicture_(ticksPerPicture),
       context_(OpenAsTaken(codec, settings, flags)),
       packet_(av::NewPacket()),
+      keyFrames_(context_->gop_size, ticksPerPicture,
+                 std::llround(av_q2d(settings.rate) * ticksPerPicture * kKeyFrameSeconds)),
       holds_(isCut) {}
 
 PictureEncoder::~PictureEncoder() {
@@ -194,7 +204,7 @@ void PictureEncoder::Encode(AVFrame& frame, int64_t tick, int64_t stay, const Pa
         waiting_.front()->duration = std::min<int64_t>(ticksPerPicture_, tick - waiting_.front()->pts);
     HandOutWaiting(take);
     frame.pts = nextIndex_++;
-    frame.pict_type = AV_PICTURE_TYPE_NONE;
+    frame.pict_type = keyFrames_.IsDue(tick) ? AV_PICTURE_TYPE_I : AV_PICTURE_TYPE_NONE;
     frame.quality = context_->global_quality;
     if (!holds_)
         return Send(&frame, take);
@@ -206,7 +216,8 @@ void PictureEncoder::Encode(AVFrame& frame, int64_t tick, int64_t stay, const Pa
 /// Nothing before the cut may build on what lies behind it: so the last picture is of the kind that builds on
 /// earlier ones only, before which no later one is coded.
 void PictureEncoder::CutHere(const PacketTaker& take) {
-    if (held_ && held_->pts > 0) // the first one builds on none
+    const bool isKeyFrame = held_ && (held_->pts == 0 || held_->pict_type == AV_PICTURE_TYPE_I);
+    if (held_ && !isKeyFrame) // which builds on none
         held_->pict_type = AV_PICTURE_TYPE_P;
     SendHeld(take);
     holds_ = false;

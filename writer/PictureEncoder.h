@@ -5,6 +5,7 @@
 #include "writer/Encoder.h"
 #include "writer/FormatTable.h"
 #include "writer/HdrLight.h"
+#include "writer/KeyFrames.h"
 
 #include <cstdint>
 #include <deque>
@@ -34,7 +35,8 @@ struct PictureSettings {
 };
 
 /// The encoder itself only counts pictures, so that its rate control sees a steady rate and no codec's limits
-/// on time bases matter; packets carry the ticks that were given with the pictures.
+/// on time bases matter; packets carry the ticks that were given with the pictures. Where those come seldom,
+/// it is asked for the key frames that it would make too late by its count.
 class PictureEncoder {
 public:
     /// Throws WriterFailure (kWriterErrorCodec). `ticksPerPicture` is the usual distance of two pictures;
@@ -71,6 +73,7 @@ private:
     const int ticksPerPicture_;
     av::CodecContext context_;
     av::Packet packet_;
+    KeyFrames keyFrames_;
     int64_t stay_ = 0;               ///< Of the picture that came last, if none follows.
     std::deque<av::Packet> waiting_; ///< The packet of that picture, and those decoded behind it.
     std::deque<int64_t> ticks_;      ///< Ticks of pictures that packets may still name, from firstIndex_ on.

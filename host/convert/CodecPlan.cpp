@@ -90,6 +90,8 @@ void PlanRate(PictureCoding& plan, const Request& request, int height) {
     plan.maxRate = request.videoMaxRate ? request.videoMaxRate : preferences.videoMaxRate;
     if (request.videoRate) {
         plan.rate = request.videoRate;
+        if (plan.maxRate)
+            plan.maxRate = std::max(*plan.maxRate, *plan.rate);
     } else {
         plan.quality = request.quality ? request.quality : PreferredQuality(preferences, plan.codec, height);
         if (plan.quality)

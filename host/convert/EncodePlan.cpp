@@ -11,9 +11,15 @@
 #include <algorithm>
 #include <cstdint>
 #include <filesystem>
+#include <optional>
 
 namespace movieconv {
 namespace {
+
+/// Where nobody asked for a rate, an upper one limits the usual one.
+int32_t RateWithin(const std::optional<int32_t>& most, int32_t rate) {
+    return most ? std::min(*most, rate) : rate;
+}
 
 void PutPictures(EncodeParam& param, const FileFormatInfo& format, const Request& request,
                  const PictureStreamInfo& source) {
@@ -28,7 +34,7 @@ void PutPictures(EncodeParam& param, const FileFormatInfo& format, const Request
         param.dFrameRate = *plan.frameRate;
     else if (Has(format, kWriterFormatSteadyRate))
         param.dFrameRate = std::min(source.peakRate, kHighestFrameRate);
-    param.nVideoBitrate = plan.rate.value_or(param.nVideoBitrate);
+    param.nVideoBitrate = RateWithin(plan.maxRate, plan.rate.value_or(param.nVideoBitrate));
     param.nVideoMaxBitrate = plan.maxRate.value_or(0);
     param.nVideoRateMode = plan.maxRate ? 1 : 0;
 }
@@ -39,7 +45,7 @@ void PutSound(EncodeParam& param, const FileFormatInfo& format, const Request& r
     param.fccAudio = plan.codec;
     param.nChannels = plan.channels.value_or(param.nChannels);
     param.nSampleRate = plan.sampleRate.value_or(param.nSampleRate);
-    param.nAudioBitrate = plan.rate.value_or(param.nAudioBitrate);
+    param.nAudioBitrate = RateWithin(plan.maxRate, plan.rate.value_or(param.nAudioBitrate));
     param.nAudioMaxBitrate = plan.maxRate.value_or(0);
     param.nAudioRateMode = plan.maxRate ? 1 : 0;
     param.nBitsPerSample = source.bitsPerSample;

@@ -270,6 +270,17 @@ TEST(EncodePlan, FillsTheEnginesRecord) {
     target.videoRate = 1'000'000;
     target.videoMaxRate = 2'000'000;
     EXPECT_EQ(+plan(target, Source()).nVideoRateMode, 1);
+    // An upper rate alone limits the usual one; one that is only preferred gives way to what is asked for.
+    Request limited = To("o.mp4");
+    limited.videoMaxRate = 300'000;
+    limited.audioMaxRate = 48'000;
+    limited.preferences.audioRate.from[1] = 160'000;
+    EXPECT_EQ(+plan(limited, Source()).nVideoBitrate, 300'000);
+    EXPECT_EQ(+plan(limited, Source()).nAudioBitrate, 48'000);
+    target.videoMaxRate.reset();
+    target.preferences.videoMaxRate = 700'000;
+    EXPECT_EQ(+plan(target, Source()).nVideoBitrate, 1'000'000);
+    EXPECT_EQ(+plan(target, Source()).nVideoMaxBitrate, 1'000'000);
 }
 
 TEST(EncodePlan, ReckonsTheLength) {

@@ -19,6 +19,7 @@ void TakePicture(const AVFrame& frame, AVRational unit, ReadMovie& movie) {
     picture.time = frame.best_effort_timestamp == AV_NOPTS_VALUE && movie.pictures.size() > 1
                        ? 2 * movie.pictures.back().time - movie.pictures[movie.pictures.size() - 2].time
                        : static_cast<double>(frame.best_effort_timestamp) * av_q2d(unit);
+    picture.isKeyFrame = frame.key_frame != 0;
     picture.width = frame.width;
     picture.height = frame.height;
     picture.luma.resize(static_cast<size_t>(frame.width) * frame.height);

@@ -15,6 +15,7 @@
 /// One decoded picture.
 struct ReadPicture {
     double time = 0; ///< Seconds.
+    bool isKeyFrame = false;
     int width = 0;
     int height = 0;
     std::vector<uint8_t> luma; ///< Rows without padding.

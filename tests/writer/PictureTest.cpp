@@ -138,6 +138,38 @@ TEST(Pictures, StampsOfAVariableRateAreKept) {
         EXPECT_NEAR(read.pictures[i].time, static_cast<double>(times[i]) / 1e7, 0.0002);
 }
 
+TEST(Pictures, AreKeyFramesEveryFewSecondsWhereTheyComeSeldom) {
+    struct {
+        uint32_t codec, format;
+    } const cases[] = {{FourCC("H264"), FourCC("MP4 ")},
+                       {FourCC("HEVC"), FourCC("MKV ")},
+                       {FourCC("VP90"), FourCC("WEBM")},
+                       {FourCC("XVID"), FourCC("MP4 ")}};
+    std::vector<int64_t> times;
+    for (int number = 0; number < 60;
+         ++number) // two seconds as usual, then one picture a second, then as usual
+        times.push_back(number < 20   ? number * int64_t{400'000}
+                        : number < 40 ? (number - 18) * int64_t{kTicksPerSecond}
+                                      : 22 * int64_t{kTicksPerSecond} + (number - 40) * int64_t{400'000});
+    for (const auto& [codec, format] : cases) {
+        SCOPED_TRACE(codec);
+        TestMovie movie = WithoutSound();
+        movie.param.fccVideo = codec;
+        movie.param.fccFileFormat = format;
+        const ReadMovie read = WriteAndRead(movie, [&](void* file) {
+            TestPicture picture(160, 120);
+            for (size_t i = 0; i < times.size(); ++i)
+                EXPECT_EQ(MWWriteVideoFrame(file, &picture.Paint(static_cast<int>(i), times[i])), 1);
+        });
+        ASSERT_EQ(read.pictures.size(), times.size());
+        double latest = 0;
+        for (const ReadPicture& picture : read.pictures) {
+            EXPECT_LE(picture.time - latest, 6.1) << "without a key frame";
+            latest = picture.isKeyFrame ? picture.time : latest;
+        }
+    }
+}
+
 TEST(Pictures, TheLastOneStaysAsLongAsItTells) {
     constexpr int64_t kMs = kTicksPerSecond / 1000;
     struct {
