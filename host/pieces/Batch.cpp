@@ -5,6 +5,7 @@
 #include "host/convert/Sources.h"
 #include "host/pieces/MarkText.h"
 #include "host/pieces/MovieErrand.h"
+#include "host/pieces/NamePattern.h"
 #include "host/pieces/OutputNames.h"
 #include "host/pieces/PlanChecks.h"
 #include "host/pieces/SettingsText.h"
@@ -52,11 +53,6 @@ std::string ExtensionFor(const Request& request) {
             throw;
         return "mp4";
     }
-}
-
-void Replace(std::string& text, const std::string& what, const std::string& by) {
-    for (std::size_t at = text.find(what); at != std::string::npos; at = text.find(what, at + by.size()))
-        text.replace(at, what.size(), by);
 }
 
 /// Those that are no secret, sorted. What a link leads to counts, if it leads anywhere.
@@ -190,7 +186,8 @@ void Batch::RequireOwnOutputs(const std::vector<Candidate>& candidates) {
                     those.end());
         if (those.size() > 1)
             throw Failure(Category::kRequest,
-                          fmt::format("\"{}\" and \"{}\" would both become \"{}\"; choose other names",
+                          fmt::format("\"{}\" and \"{}\" would both become \"{}\"; choose other names, as "
+                                      "with --names \"{{folder}}-{{name}}-{{from}}.{{ext}}\"",
                                       those[0]->input, those[1]->input, target));
     }
 }
@@ -214,9 +211,7 @@ bool Batch::IsSource(const std::string& path) const {
 }
 
 std::string Batch::OutputFor(const std::string& input, const std::string& extension) const {
-    std::string name = order_.names;
-    Replace(name, "{ext}", extension);
-    Replace(name, "{name}", fs::path(input).stem().string());
+    const std::string name = NameAfter(order_.names, input, extension);
     std::string path = order_.folder + "/" + name;
     if (name.empty() || name.find('/') != std::string::npos || path == JournalIn(order_.folder))
         throw Failure(Category::kRequest,

@@ -20,7 +20,7 @@ namespace movieconv {
 struct BatchOrder {
     std::vector<std::string> inputs;    ///< Files, and folders whose files are meant.
     std::string folder;                 ///< Where the outputs go; made when it is missing.
-    std::string names = "{name}.{ext}"; ///< {name}: the input's without its extension; {ext}: the format's.
+    std::string names = "{name}.{ext}"; ///< As NameAfter takes it.
     Request request;                    ///< Without names.
     int jobs = 1;                       ///< Movies at once; 0: one for every two processors.
 };

@@ -249,6 +249,11 @@ TEST(ManyMovies, TakeNoNamesFromWhatIsNone) {
     const Result twice = movies.Convert();
     EXPECT_EQ(twice.code, 2);
     EXPECT_TRUE(Has(twice.err, "would both become")) << twice.err;
+    const Result apart = movies.Convert({"--names", "{folder}-{name}{from}.{ext}"});
+    EXPECT_EQ(apart.code, 0) << apart.err;
+    for (const char* name : {"in-amkv.mp4", "in-amka.mp4"})
+        EXPECT_TRUE(std::filesystem::exists(movies.out + "/" + name)) << name;
+    EXPECT_TRUE(Has(movies.Convert({"--names", "{name}{nothing}.{ext}"}).err, "not \"{nothing}\""));
 }
 
 TEST(ManyMovies, AreNamedByWhatIsToldOfThem) {
