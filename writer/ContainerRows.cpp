@@ -20,6 +20,7 @@ constexpr uint32_t kLanguages = kWriterFormatLanguages;
 constexpr uint32_t kTitles = kWriterFormatTrackTitles;
 constexpr uint32_t kTimecode = kWriterFormatTimecode;
 constexpr uint32_t kChapterTexts = kWriterFormatChapterTexts;
+constexpr uint32_t kEarlyChapters = kWriterFormatEarlyChapters;
 constexpr uint32_t kNoPictureLanguage = kWriterFormatNoPictureLanguage;
 constexpr uint32_t kSmallPackets = kWriterFormatSmallPackets;
 constexpr uint32_t kJoinsFrames = kWriterFormatJoinsFrames;
@@ -213,7 +214,7 @@ constexpr std::array kContainerRows{
         .name = "MP3",
         .extensions = "mp3",
         .muxer = "mp3",
-        .carries = kTags | kCover | kCoverText,
+        .carries = kTags | kCover | kCoverText | kEarlyChapters,
         .copiedSound = "mp3",
         .ways = kCountsSamples,
         .audio = {kMp3},

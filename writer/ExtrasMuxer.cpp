@@ -157,7 +157,17 @@ int ExtrasMuxer::WriteCover(AVFormatContext& output) const {
 }
 
 void ExtrasMuxer::SetChapters(AVFormatContext& output, const std::vector<OutputChapter>& chapters) const {
-    if (!Carries(kWriterFormatChapters) || fragmented_ || chapters.empty())
+    if (Carries(kWriterFormatChapters) && !fragmented_)
+        AddChapters(output, chapters);
+}
+
+void ExtrasMuxer::SetEarlyChapters(AVFormatContext& output) const {
+    if (Carries(kWriterFormatEarlyChapters))
+        AddChapters(output, extras_.chapters);
+}
+
+void ExtrasMuxer::AddChapters(AVFormatContext& output, const std::vector<OutputChapter>& chapters) const {
+    if (chapters.empty())
         return;
     output.chapters = New<AVChapter*>(chapters.size());
     for (const OutputChapter& chapter : chapters) {

@@ -24,10 +24,13 @@ public:
     /// Streams for cover and attachments, once all others are there.
     void AddStreams(AVFormatContext& output);
 
+    /// For containers that have them in their header.
+    void SetEarlyChapters(AVFormatContext& output) const;
+
     /// Right after the header.
     int WriteCover(AVFormatContext& output) const;
 
-    /// On the file's timeline, before its end.
+    /// On the file's timeline, before its end; for all other containers.
     void SetChapters(AVFormatContext& output, const std::vector<OutputChapter>& chapters) const;
 
     /// Whether languages have a place for a tag beside their code.
@@ -39,6 +42,7 @@ public:
 private:
     bool Carries(uint32_t what) const { return (container_.carries & what) != 0; }
     void AddAttachments(AVFormatContext& output) const;
+    void AddChapters(AVFormatContext& output, const std::vector<OutputChapter>& chapters) const;
     void AddCover(AVFormatContext& output);
 
     const Container& container_;

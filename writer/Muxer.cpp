@@ -103,6 +103,7 @@ int Muxer::AddStream(const MuxedStream& stream) {
 void Muxer::WriteHeader(int64_t room) {
     SetOptions(room);
     extras_.AddStreams(*output_);
+    extras_.SetEarlyChapters(*output_);
     Check(avformat_write_header(output_.get(), nullptr), "refuses its header");
     Check(extras_.WriteCover(*output_), "refuses its cover");
     SetLanguageTags();

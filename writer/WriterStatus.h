@@ -230,7 +230,10 @@ enum {
     kWriterFormatNoPictureLanguage = 2048, ///< The languages that it carries are of sound and subtitles only.
     kWriterFormatSmallPackets = 4096,      ///< All is cut into small packets, whose heads take room.
     /// Holds E-AC-3 in frames of six blocks only: sound of shorter ones cannot be carried as it is.
-    kWriterFormatJoinsFrames = 8192
+    kWriterFormatJoinsFrames = 8192,
+    /// Carries chapters, which are written when a file begins, and so on the file's timeline: see
+    /// MWAddChapter.
+    kWriterFormatEarlyChapters = 16384
 };
 
 /// kWriterFormat... of the format with that code, together; 0 for one that is not in the table.
@@ -347,7 +350,8 @@ int MWCarriesPackets(uint32_t format, const char* codec);
 enum { kWriterShortestChapter = 10000 };
 
 /// A chapter, in the source's time (100 ns units). Each file gets what lies in it, on its own timeline, when
-/// it is closed, unless that is shorter than kWriterShortestChapter. `title` may be null.
+/// it is closed, unless that is shorter than kWriterShortestChapter. Formats of kWriterFormatEarlyChapters
+/// get it as it is, so that its times are the file's. `title` may be null.
 int MWAddChapter(uint32_t set, int64_t begin, int64_t end, const char* title);
 
 /// A cover, as JPEG or PNG; a second call replaces it. In MP4, MOV and M4A it comes with the close.

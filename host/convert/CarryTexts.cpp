@@ -94,35 +94,48 @@ bool HasLength(const Chapter& chapter) {
     return Ticks(chapter.end) - Ticks(chapter.begin) >= kWriterShortestChapter;
 }
 
-/// How many chapters were left out, because they make no sense.
-int AddChapters(const SourceInfo& source, uint32_t set) {
+/// How many chapters the writer did not take.
+int AddChapters(const std::vector<Chapter>& chapters, uint32_t set) {
     int left = 0;
-    for (const Chapter& chapter : source.chapters)
-        if (!HasLength(chapter) ||
+    for (const Chapter& chapter : chapters)
+        if (HasLength(chapter) &&
             MWAddChapter(set, Ticks(chapter.begin), Ticks(chapter.end), chapter.title.c_str()) == 0)
             ++left;
     return left;
 }
 
-/// AddChapters as texts, of what lies in the one file that the request asks for.
-int AddChapterTexts(const SourceInfo& source, const Request& request, uint32_t set) {
+/// Those that lie in the one file that the request asks for, on its timeline.
+std::vector<Chapter> ChaptersWithin(const std::vector<Chapter>& chapters, const Request& request) {
+    const double end = request.length.value_or(HUGE_VAL);
+    std::vector<Chapter> within;
+    for (Chapter chapter : chapters) {
+        chapter.begin = std::max(chapter.begin - request.begin, 0.0);
+        chapter.end = std::min(chapter.end - request.begin, end);
+        if (chapter.begin < chapter.end)
+            within.push_back(std::move(chapter));
+    }
+    return within;
+}
+
+/// AddChapters as texts.
+int AddChapterTexts(const std::vector<Chapter>& chapters, uint32_t set) {
     constexpr int kMost = 999;
     int number = 0;
     int left = 0;
-    for (const Chapter& chapter : source.chapters) {
-        const double begin = std::max(chapter.begin - request.begin, 0.0);
-        const bool isThere = chapter.end > request.begin && (!request.length || begin < *request.length);
-        if (!HasLength(chapter) || (isThere && number == kMost)) {
+    for (const Chapter& chapter : chapters) {
+        if (!HasLength(chapter))
+            continue;
+        if (number == kMost) {
             ++left;
-        } else if (isThere) {
-            const auto milliseconds = std::llround(begin * 1000);
-            const std::string key = fmt::format("CHAPTER{:03}", ++number);
-            MWSetTag(set, key.c_str(),
-                     fmt::format("{:02}:{:02}:{:02}.{:03}", milliseconds / 3'600'000,
-                                 milliseconds / 60'000 % 60, milliseconds / 1000 % 60, milliseconds % 1000)
-                         .c_str());
-            MWSetTag(set, (key + "NAME").c_str(), chapter.title.c_str());
+            continue;
         }
+        const auto milliseconds = std::llround(chapter.begin * 1000);
+        const std::string key = fmt::format("CHAPTER{:03}", ++number);
+        MWSetTag(set, key.c_str(),
+                 fmt::format("{:02}:{:02}:{:02}.{:03}", milliseconds / 3'600'000, milliseconds / 60'000 % 60,
+                             milliseconds / 1000 % 60, milliseconds % 1000)
+                     .c_str());
+        MWSetTag(set, (key + "NAME").c_str(), chapter.title.c_str());
     }
     return left;
 }
@@ -196,8 +209,15 @@ std::vector<NotCarried> LostTexts(const SourceInfo& source, const Request& reque
 
 int CarryChapters(const SourceInfo& source, const Request& request, const FileFormatInfo& format,
                   uint32_t set) {
-    return Has(format, kWriterFormatChapterTexts) ? AddChapterTexts(source, request, set)
-                                                  : AddChapters(source, set);
+    const std::vector<Chapter>& all = source.chapters;
+    const auto wrong =
+        std::count_if(all.begin(), all.end(), [](const Chapter& each) { return !HasLength(each); });
+    const auto left = static_cast<int>(wrong);
+    if (Has(format, kWriterFormatChapters))
+        return left + AddChapters(all, set);
+    const std::vector<Chapter> within = ChaptersWithin(all, request);
+    return left +
+           (Has(format, kWriterFormatChapterTexts) ? AddChapterTexts(within, set) : AddChapters(within, set));
 }
 
 int ChaptersOutside(const SourceInfo& source) {
@@ -219,8 +239,8 @@ Sentence FurtherChapterTexts(const SourceInfo& source) {
 
 std::optional<NotCarried> WhyChaptersStay(const SourceInfo& source, const Request& request,
                                           const FileFormatInfo& format) {
-    if (Has(format, kWriterFormatChapters | kWriterFormatChapterTexts) || source.chapters.empty() ||
-        request.noChapters)
+    constexpr uint32_t kAny = kWriterFormatChapters | kWriterFormatChapterTexts | kWriterFormatEarlyChapters;
+    if (Has(format, kAny) || source.chapters.empty() || request.noChapters)
         return std::nullopt;
     return NotCarried{"chapters", std::nullopt, {}, {}, Say("{} cannot hold them", ShortName(format))};
 }

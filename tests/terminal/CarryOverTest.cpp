@@ -160,7 +160,7 @@ TEST(CarryOver, MovesChaptersWithTheRange) {
     const std::string read = Probe(folder / "out.mkv");
     EXPECT_TRUE(Has(read, "start_time=0.000000|end_time=0.600000|tag:title=First")) << read;
     EXPECT_TRUE(Has(read, "start_time=0.600000|end_time=1.2")) << read;
-    for (const char* name : {"out.ogg", "out.flac"}) {
+    for (const char* name : {"out.ogg", "out.flac", "out.mp3"}) {
         ASSERT_EQ(Call({whole, folder / name, "--begin", "0.4", "--length", "1.2", "-q"}).code, 0);
         const std::string texts = Probe(folder / name);
         EXPECT_TRUE(Has(texts, "start_time=0.000000|end_time=0.600000|tag:title=First")) << texts;

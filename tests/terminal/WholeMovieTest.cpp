@@ -57,7 +57,7 @@ const Room kRooms[] = {
     {"avi", {}, "", "", false, true, false, false},
     {"ts", {}, "", "dvb_subtitle", false, true, false, false},
     {"flv", {}, "", "", false, false, false, false},
-    {"mp3", {}, "", "", false, false, true, false},
+    {"mp3", {}, "", "", true, false, true, false},
     {"flac", {}, "", "", true, false, true, false},
     {"ogg", {}, "", "", true, false, false, false},
     {"wav", {}, "", "", false, false, false, false},
