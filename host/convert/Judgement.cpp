@@ -77,7 +77,7 @@ std::optional<Failure> FindFailure(const Evidence& evidence) {
                            : Say("reading \"{}\" failed after {}: {}; what was read is converted",
                                  request.input, reached, reason));
     }
-    if (const std::optional<Failure> excess = FindExcess(request, files))
+    if (std::optional<Failure> excess = FindExcess(request, files))
         return excess;
     if (evidence.engineOutcome == kOutcomeCompleted ||
         (evidence.userStopped && evidence.engineOutcome == kOutcomeStopped))
