@@ -177,7 +177,7 @@ void Muxer::Write(AVPacket& packet, int stream) {
         return;
     av_packet_move_ref(packet_.get(), &packet);
     packet_->stream_index = stream;
-    SetTimes(*packet_, state, out->time_base);
+    SetTimes(*packet_, state, *out);
     const int64_t time = av_rescale_q(packet_->dts, out->time_base, av_get_time_base_q());
     const int counted = IsEmptyText(*packet_, out->codecpar->codec_id) ? 0 : 1;
     Interleave(*packet_);
@@ -187,12 +187,14 @@ void Muxer::Write(AVPacket& packet, int stream) {
 }
 
 /// In the file's unit; those of decoding rise.
-void Muxer::SetTimes(AVPacket& packet, State& state, AVRational unit) const {
-    av_packet_rescale_ts(&packet, state.unit, unit);
+void Muxer::SetTimes(AVPacket& packet, State& state, const AVStream& out) const {
+    av_packet_rescale_ts(&packet, state.unit, out.time_base);
     packet.pts += state.delay;
     packet.dts += state.delay;
-    // A coarse unit can make two times equal. Many texts may be shown at one time.
-    const int64_t step = state.sparse && extras_.IsMatroska() ? 0 : 1;
+    // A coarse unit can make two times equal. Many texts may be shown at one time, and packets of sound may
+    // be shorter than the unit, as TrueHD's: a step for each would make it longer.
+    const bool mayCoincide = extras_.IsMatroska() && out.codecpar->codec_type != AVMEDIA_TYPE_VIDEO;
+    const int64_t step = mayCoincide ? 0 : 1;
     if (state.lastDts != AV_NOPTS_VALUE && packet.dts < state.lastDts + step) {
         packet.dts = state.lastDts + step;
         packet.pts = std::max(packet.pts, packet.dts);

@@ -93,7 +93,7 @@ private:
     void Check(int result, const char* what) const;
     void SetOptions(int64_t room);
     void SetDelays();
-    void SetTimes(AVPacket& packet, State& state, AVRational unit) const;
+    void SetTimes(AVPacket& packet, State& state, const AVStream& out) const;
     void Interleave(AVPacket& packet);
     void TellLastStay();
     int64_t MostApart(int packetSize);

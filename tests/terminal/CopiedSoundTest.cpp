@@ -104,6 +104,7 @@ TEST(CopiedSound, GoesUnchangedIntoWhatHoldsIt) {
         {"short_eac3.mkv", "-c:a eac3 -b:a 3000k", {"mkv", "ts"}, {"mp4"}, "mkv"},
         {"copied_flac.mkv", "-c:a flac", {"mkv", "flac", "ogg"}, {"mp4", "m4a"}, "flac"},
         {"copied_dts.mkv", "-c:a dca", {"mkv", "ts", "mp4"}, {"mov"}, "mkv"},
+        {"copied_truehd.mkv", "-c:a truehd", {"mkv", "ts"}, {"mp4"}, "mkv"},
         {"copied_pcm.mov", "-c:a pcm_s24le", {"mov", "mkv", "wav"}, {"mp4"}, "mov"},
     };
     for (const auto& test : cases) {
@@ -161,7 +162,9 @@ TEST(CopiedSound, IsInOneClipOrTheOtherAndInStepWithThePictures) {
                  {"copied_opus.mkv", "-c:a libopus", "mp4"},
                  {"copied_ac3.ts", "-c:a ac3", "mp4"},
                  {"copied_mp3.mp4", "-c:a libmp3lame", "mkv"},
-                 {"copied_flac.mkv", "-c:a flac", "mkv"}};
+                 {"copied_flac.mkv", "-c:a flac", "mkv"},
+                 // Its packets are shorter than the container's unit.
+                 {"copied_truehd.mkv", "-c:a truehd", "mkv"}};
     for (const auto& test : cases) {
         SCOPED_TRACE(std::string(test.source) + " into " + test.format);
         const std::string source = WithSound(test.source, test.codec);
