@@ -103,7 +103,7 @@ TEST(CopiedSound, GoesUnchangedIntoWhatHoldsIt) {
         {"copied_eac3.mkv", "-c:a eac3", {"mp4", "mov", "mkv", "ts"}, {"avi", "m4a"}, "mkv"},
         {"short_eac3.mkv", "-c:a eac3 -b:a 3000k", {"mkv", "ts"}, {"mp4"}, "mkv"},
         {"copied_flac.mkv", "-c:a flac", {"mkv", "flac", "ogg"}, {"mp4", "m4a"}, "flac"},
-        {"copied_dts.mkv", "-c:a dca", {"mkv", "ts", "mp4"}, {"mov"}, "mkv"},
+        {"copied_dts.mkv", "-c:a dca", {"mkv", "ts", "mp4"}, {"mov", "avi"}, "mkv"},
         {"copied_truehd.mkv", "-c:a truehd", {"mkv", "ts"}, {"mp4"}, "mkv"},
         {"copied_pcm.mov", "-c:a pcm_s24le", {"mov", "mkv", "wav"}, {"mp4"}, "mov"},
     };
