@@ -16,23 +16,11 @@ constexpr SpeedScale kAv1Speeds{.option = "preset", .values = {"2", "4", "6", "8
 
 constexpr const char* kVpxOptions = "deadline=good";
 
-/// With AVX-512, x264 reads memory that nobody wrote where a row of macroblocks is no multiple of eight, and
-/// what was there before decides about bits. The code for AVX2 is as fast and gives what every processor
-/// does.
-const char* X264Options() {
-#if defined(__x86_64__) || defined(__i386__)
-    __builtin_cpu_init();
-    if (__builtin_cpu_supports("avx512f"))
-        return "x264-params=asm=avx2";
-#endif
-    return "";
-}
-
 constexpr std::array kMpeg2Rates{AVRational{24000, 1001}, AVRational{24, 1}, AVRational{25, 1},
                                  AVRational{30000, 1001}, AVRational{30, 1}, AVRational{50, 1},
                                  AVRational{60000, 1001}, AVRational{60, 1}, AVRational{0, 1}};
 
-const std::array kPictureRows{
+constexpr std::array kPictureRows{
     PictureCodec{.code = kXvid, .id = AV_CODEC_ID_MPEG4, .encoder = "mpeg4", .quality = kQuantiser},
     PictureCodec{
         .code = kH264,
@@ -43,7 +31,6 @@ const std::array kPictureRows{
         .quality = kCrf51,
         .speed = kX26Speeds,
         .looksAhead = {70, 70, 56, 46, 36, 16, 0},
-        .options = X264Options(),
     },
     PictureCodec{
         .code = kHevc,

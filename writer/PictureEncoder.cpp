@@ -47,6 +47,16 @@ std::string LightParameters(const std::string& options, const HdrLight& light) {
     return parameters;
 }
 
+/// With AVX-512, x264 reads memory that nobody wrote where a row of macroblocks is no multiple of eight, and
+/// what was there before decides about bits. The code for AVX2 is as fast and gives what every processor
+/// does.
+void LeaveOutAvx512([[maybe_unused]] AVCodecContext& context) {
+#if defined(__x86_64__) || defined(__i386__)
+    if (__builtin_cpu_supports("avx512f"))
+        SetOption(context, "x264-params", "asm=avx2");
+#endif
+}
+
 void SetSpeed(AVCodecContext& context, const SpeedScale& scale, const PictureSettings& settings) {
     if (scale.option == nullptr)
         return;
@@ -136,6 +146,8 @@ av::CodecContext OpenWith(const PictureCodec& codec, const PictureSettings& sett
     context.color_trc = settings.transfer;
     context.colorspace = settings.matrix;
     SetOptions(context, options);
+    if (codec.id == AV_CODEC_ID_H264)
+        LeaveOutAvx512(context);
     if (settings.light && codec.id == AV_CODEC_ID_HEVC) // which also tells it in its own stream
         SetOption(context, "x265-params", LightParameters(options, *settings.light));
     SetSpeed(context, codec.speed, settings);

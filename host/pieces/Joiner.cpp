@@ -22,6 +22,7 @@
 
 #include <atomic>
 #include <condition_variable>
+#include <cstddef>
 #include <fmt/format.h>
 #include <future>
 #include <mutex>
@@ -71,10 +72,13 @@ Request JoinRequest(const Plan& plan, const JoinOrder& order) {
 /// Has the media writer join them. `goesOn` is asked with the share that is done whether to go on.
 void Join(const Plan& plan, const std::string& planPath, const Request& request, Movie& movie,
           const Engine& engine, std::function<bool(double)> goesOn) {
+    const auto count = static_cast<std::size_t>(plan.Pieces());
     std::vector<std::string> paths;
+    paths.reserve(count);
     for (int number = 0; number < plan.Pieces(); ++number)
         paths.push_back(PiecePath(planPath, number));
     std::vector<const char*> names;
+    names.reserve(count);
     for (const std::string& path : paths)
         names.push_back(path.c_str());
     WriterJoin join{};

@@ -55,7 +55,7 @@ Stretch ReadPictures(PacketReader& reader, const SourceInfo& info) {
     AVStream* sound = info.sound ? reader.Context()->streams[info.sound->index] : nullptr;
     if (sound != nullptr)
         sound->discard = AVDISCARD_ALL;
-    const Stretch begin = ReadStretch(reader, info.pictures->index, 8 * kStretchBytes, kCountedPictures);
+    Stretch begin = ReadStretch(reader, info.pictures->index, 8 * kStretchBytes, kCountedPictures);
     if (sound != nullptr)
         sound->discard = AVDISCARD_DEFAULT;
     ReturnToBegin(reader, info);
@@ -84,6 +84,7 @@ std::vector<double> StampsOfPictures(PacketReader& reader, const SourceInfo& inf
     if (indexed < 2)
         return ReadPictures(reader, info).stamps;
     std::vector<double> stamps;
+    stamps.reserve(static_cast<std::size_t>(indexed));
     for (int i = 0; i < indexed; ++i)
         stamps.push_back(static_cast<double>(avformat_index_get_entry(stream, i)->timestamp) *
                          av_q2d(stream->time_base));

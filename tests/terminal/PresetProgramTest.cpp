@@ -181,6 +181,22 @@ TEST(ProgramQuality, IsTheEncodersAndLimitedByAnUpperRateAlone) {
     }
 }
 
+// Pieces of one plan are made on different machines and again after a kill.
+TEST(ProgramPresets, GiveTheSamePicturesWhateverIsInFreshMemory) {
+    const Folder folder;
+    const std::string source = Make("fresh-memory.mkv", {"-f", "lavfi", "-i", "testsrc2=s=320x240:r=25:d=3"});
+    const auto made = [&](const char* filledWith) {
+        const Result result =
+            program::Run({"env", std::string("MALLOC_PERTURB_=") + filledWith, MOVIECONV_PROGRAM, "-q", "-y",
+                          "--no-audio", source, folder / "o.mkv"});
+        EXPECT_EQ(result.code, 0) << result.err;
+        return FfmpegReads(folder / "o.mkv", Words("-c copy -f framemd5"));
+    };
+    const std::string usual = made("0");
+    for (const char* filledWith : {"85", "170"})
+        EXPECT_EQ(made(filledWith), usual);
+}
+
 struct Sized {
     const char* name;
     const char* pictures; ///< An lavfi source; empty: none.
