@@ -104,11 +104,16 @@ int AddChapters(const std::vector<Chapter>& chapters, uint32_t set) {
     return left;
 }
 
+/// Seconds of the source, as far as that is known.
+double EndOf(const SourceInfo& source) {
+    return source.certainty == Certainty::kKnown ? source.duration : HUGE_VAL;
+}
+
 /// Those that lie in the one file that the request asks for, on its timeline.
-std::vector<Chapter> ChaptersWithin(const std::vector<Chapter>& chapters, const Request& request) {
-    const double end = request.length.value_or(HUGE_VAL);
+std::vector<Chapter> ChaptersWithin(const SourceInfo& source, const Request& request) {
+    const double end = std::min(request.length.value_or(HUGE_VAL), EndOf(source) - request.begin);
     std::vector<Chapter> within;
-    for (Chapter chapter : chapters) {
+    for (Chapter chapter : source.chapters) {
         chapter.begin = std::max(chapter.begin - request.begin, 0.0);
         chapter.end = std::min(chapter.end - request.begin, end);
         if (chapter.begin < chapter.end)
@@ -215,13 +220,13 @@ int CarryChapters(const SourceInfo& source, const Request& request, const FileFo
     const auto left = static_cast<int>(wrong);
     if (Has(format, kWriterFormatChapters))
         return left + AddChapters(all, set);
-    const std::vector<Chapter> within = ChaptersWithin(all, request);
+    const std::vector<Chapter> within = ChaptersWithin(source, request);
     return left +
            (Has(format, kWriterFormatChapterTexts) ? AddChapterTexts(within, set) : AddChapters(within, set));
 }
 
 int ChaptersOutside(const SourceInfo& source) {
-    const double end = source.certainty == Certainty::kKnown ? source.duration : HUGE_VAL;
+    const double end = EndOf(source);
     return static_cast<int>(
         std::count_if(source.chapters.begin(), source.chapters.end(), [&](const Chapter& chapter) {
             return HasLength(chapter) && (chapter.end <= 0 || chapter.begin >= end);

@@ -166,6 +166,16 @@ TEST(CarryOver, MovesChaptersWithTheRange) {
         EXPECT_TRUE(Has(texts, "start_time=0.000000|end_time=0.600000|tag:title=First")) << texts;
         EXPECT_TRUE(Has(texts, "start_time=0.600000|")) << texts;
     }
+    const std::string more = folder / "more.mkv"; // the second chapter lies behind its end
+    test_movies::Ffmpeg({"-i", whole, "-map", "0:v", "-map", "0:a", "-t", "0.8", "-map_chapters", "-1",
+                         folder / "short.mkv"});
+    test_movies::Ffmpeg(
+        {"-i", folder / "short.mkv", "-i", whole, "-map", "0", "-map_chapters", "1", "-c", "copy", more});
+    for (const char* name : {"more.ogg", "more.mp3"}) {
+        const Result made = Call({more, folder / name, "--progress", "none"});
+        EXPECT_TRUE(Has(made.err, "not carried: chapters")) << made.err;
+        EXPECT_FALSE(Has(Probe(folder / name), "Second")) << name;
+    }
     // What was carried is carried again, and MP4's own track of chapters is not told.
     const Result again = Call({folder / "out.mkv", folder / "again.mp4", "--progress", "none"});
     const Result third = Call({folder / "again.mp4", folder / "third.mp4", "--progress", "none"});
