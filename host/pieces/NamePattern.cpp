@@ -6,16 +6,19 @@
 #include <filesystem>
 #include <fmt/format.h>
 #include <map>
+#include <system_error>
 
 namespace movieconv {
 
 std::string NameAfter(const std::string& pattern, const std::string& input, const std::string& extension) {
-    const std::filesystem::path path = std::filesystem::absolute(input);
+    const std::filesystem::path path = input;
+    std::error_code unknown; // where the working folder is gone
+    const std::filesystem::path folder = std::filesystem::absolute(path, unknown).parent_path();
     const std::string dotted = path.extension().string();
     const std::map<std::string, std::string> words{
         {"{name}", path.stem().string()},
         {"{from}", dotted.empty() ? dotted : dotted.substr(1)},
-        {"{folder}", path.parent_path().filename().string()},
+        {"{folder}", folder.filename().string()},
         {"{ext}", extension},
     };
     std::string name;

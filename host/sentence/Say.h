@@ -28,6 +28,9 @@ Sentence SayList(std::vector<Sentence> items);
 /// `one` for a single thing, `many` for several; empty for none, of which nothing is told.
 Sentence SayCounted(int64_t count, Sentence one, Sentence many);
 
+/// Adds `text` to `texts` unless it is empty.
+void AddTold(std::vector<Sentence>& texts, Sentence text);
+
 /// The place with that number, from 0, of those in a pattern: "{}" or, with how it is to be filled, "{:.1f}".
 std::string_view PlaceIn(std::string_view pattern, std::size_t number);
 

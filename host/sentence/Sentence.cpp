@@ -35,6 +35,11 @@ Sentence SayCounted(int64_t count, Sentence one, Sentence many) {
     return count <= 0 ? Sentence() : count == 1 ? std::move(one) : std::move(many);
 }
 
+void AddTold(std::vector<Sentence>& texts, Sentence text) {
+    if (!text.IsEmpty())
+        texts.push_back(std::move(text));
+}
+
 std::string_view PlaceIn(std::string_view pattern, std::size_t number) {
     std::size_t begin = pattern.find('{');
     for (; number > 0; --number)

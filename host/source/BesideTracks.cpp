@@ -121,23 +121,23 @@ bool BesideTracks::Copies(int stream) const {
 
 std::vector<Sentence> BesideTracks::Complaints() const {
     std::vector<Sentence> texts;
-    const auto add = [&texts](Sentence text) {
-        if (!text.IsEmpty())
-            texts.push_back(std::move(text));
-    };
-    add(TellEarliestCue(earlierCues_.earliest, bounds_.begin));
+    AddTold(texts, TellEarliestCue(earlierCues_.earliest, bounds_.begin));
     const int64_t cues = cuesInOtherCharset_;
-    add(SayCounted(cues, Say("1 of its subtitles was not in UTF-8 and taken for Windows-1252"),
-                   Say("{} of its subtitles were not in UTF-8 and taken for Windows-1252", cues)));
+    AddTold(texts, SayCounted(cues, Say("1 of its subtitles was not in UTF-8 and taken for Windows-1252"),
+                              Say("{} of its subtitles were not in UTF-8 and taken for Windows-1252", cues)));
     for (const BesideSound* sound : sounds_) {
         const int stream = sound->Stream();
         const int64_t damaged = sound->Damaged();
-        add(SayCounted(damaged, Say("1 damaged piece of sound data was skipped in stream {}", stream),
+        AddTold(
+            texts,
+            SayCounted(damaged, Say("1 damaged piece of sound data was skipped in stream {}", stream),
                        Say("{} damaged pieces of sound data were skipped in stream {}", damaged, stream)));
         const int closed = sound->Corrections();
-        add(SayCounted(
-            closed, Say("the sound of stream {} had 1 gap or overlap, which was closed", stream),
-            Say("the sound of stream {} had {} gaps or overlaps, which were closed", stream, closed)));
+        AddTold(texts,
+                SayCounted(closed,
+                           Say("the sound of stream {} had 1 gap or overlap, which was closed", stream),
+                           Say("the sound of stream {} had {} gaps or overlaps, which were closed", stream,
+                               closed)));
     }
     return texts;
 }

@@ -180,27 +180,24 @@ std::vector<Sentence> Movie::Losses() const {
 
 std::vector<Sentence> Movie::Complaints() const {
     std::vector<Sentence> texts;
-    const auto add = [&texts](Sentence text) {
-        if (!text.IsEmpty())
-            texts.push_back(std::move(text));
-    };
     for (const LateStreams::Left& left : demuxer_.LeftOut())
-        add(TellLate(left));
-    add(TellJumps(demuxer_.ClockJumps()));
+        AddTold(texts, TellLate(left));
+    AddTold(texts, TellJumps(demuxer_.ClockJumps()));
     if (pictures_) {
-        add(TellDamaged(*pictures_));
-        add(TellRepaired(*pictures_));
+        AddTold(texts, TellDamaged(*pictures_));
+        AddTold(texts, TellRepaired(*pictures_));
     }
     if (sound_) {
-        add(TellDamaged(*sound_));
-        add(TellClosed(*sound_));
+        AddTold(texts, TellDamaged(*sound_));
+        AddTold(texts, TellClosed(*sound_));
     }
     if (sound_ && !beside_.Copies(Info().sound->index) && sound_->Channels() > Info().sound->channels)
-        add(Say("some of its sound has {} channels and got {}", sound_->Channels(), Info().sound->channels));
+        AddTold(texts, Say("some of its sound has {} channels and got {}", sound_->Channels(),
+                           Info().sound->channels));
     for (Sentence& text : beside_.Complaints())
-        add(std::move(text));
+        AddTold(texts, std::move(text));
     if (burner_ && std::find(texts.begin(), texts.end(), burner_->Unread()) == texts.end())
-        add(burner_->Unread());
+        AddTold(texts, burner_->Unread());
     return texts;
 }
 
