@@ -97,8 +97,8 @@ def test_colours_are_what_the_file_says_in_every_size(tmp_path, size):
     movieconv.write(tmp_path / "out.mp4", [red] * 3, video_codec="H264", video_bitrate=4_000_000)
     space = subprocess.run(["ffprobe", "-v", "error", "-show_entries", "stream=color_space", "-of", "csv=p=0",
                             tmp_path / "out.mp4"], capture_output=True, text=True, check=True).stdout.strip()
-    seen = subprocess.run(["ffmpeg", "-v", "error", "-i", tmp_path / "out.mp4", "-frames:v", "1", "-f", "rawvideo",
-                           "-pix_fmt", "rgb24", "-"], capture_output=True, check=True).stdout[:3]
+    seen = subprocess.run(["ffmpeg", "-v", "error", "-nostdin", "-i", tmp_path / "out.mp4", "-frames:v", "1",
+                           "-f", "rawvideo", "-pix_fmt", "rgb24", "-"], capture_output=True, check=True).stdout[:3]
     assert space == "smpte170m" and seen[0] > 248 and max(seen[1:]) < 6
 
 
