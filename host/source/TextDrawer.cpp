@@ -14,6 +14,7 @@
 #include <fmt/format.h>
 #include <fstream>
 #include <optional>
+#include <set>
 #include <system_error>
 #include <utility>
 
@@ -199,14 +200,10 @@ public:
     Canvas Draw(int64_t time) override {
         if (active_.empty())
             return {};
-        const av::Frame canvas = NewCanvas();
-        // The middle of the millisecond, lest rounding changes it.
-        canvas->pts = time / (kTicksPerSecond / 1000) * 1000 + 500;
-        av::Frame drawn;
-        Drawing([&] {
-            graph_->Push(*canvas);
-            drawn = graph_->Take();
-        });
+        if (!std::exchange(placed_, true))
+            for (const int64_t begin : BeginsThatPlace())
+                Drawn(begin * kHundredth);
+        const av::Frame drawn = Drawn(time);
         return drawn ? Trimmed(drawn->data[0], drawn->linesize[0], width_, height_) : Canvas{};
     }
 
@@ -238,6 +235,27 @@ private:
             }
     }
 
+    /// When the texts began that are seen now, and those on which their places depend (hundredths, rising):
+    /// libass stacks a text upon what is seen as it appears and leaves it there. Drawn at these times, a
+    /// conversion that begins amid texts has them where one from the movie's begin has them.
+    std::set<int64_t> BeginsThatPlace() const {
+        std::set<int64_t> begins;
+        std::vector<const Event*> open = active_;
+        while (!open.empty()) {
+            const int64_t begin = open.back()->begin;
+            open.pop_back();
+            if (!begins.insert(begin).second)
+                continue;
+            for (const Event& other : script_.Events()) {
+                if (other.begin >= begin)
+                    break;
+                if (other.end > begin)
+                    open.push_back(&other);
+            }
+        }
+        return begins;
+    }
+
     bool AnythingMoves() const {
         return std::any_of(active_.begin(), active_.end(), [](const Event* event) { return event->moves; });
     }
@@ -250,6 +268,18 @@ private:
         } catch (const av::FilterError& error) {
             throw SourceError(Say("the subtitles cannot be drawn: {}", WordsOf(error)));
         }
+    }
+
+    av::Frame Drawn(int64_t time) {
+        const av::Frame canvas = NewCanvas();
+        // The middle of the millisecond, lest rounding changes it.
+        canvas->pts = time / (kTicksPerSecond / 1000) * 1000 + 500;
+        av::Frame drawn;
+        Drawing([&] {
+            graph_->Push(*canvas);
+            drawn = graph_->Take();
+        });
+        return drawn;
     }
 
     av::Frame NewCanvas() const {
@@ -280,6 +310,7 @@ private:
     std::size_t next_ = 0;
     std::vector<const Event*> active_;
     bool changed_ = false; // since it was asked for last
+    bool placed_ = false;  // the texts that are seen from the first picture on
 };
 
 } // namespace

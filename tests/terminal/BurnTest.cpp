@@ -200,6 +200,31 @@ TEST(Burn, IsThereHoweverLongBeforeTheBeginItAppeared) {
 
 /// Slides of 10 s, and a recording whose pictures come only when something happens: texts do not wait for the
 /// next picture.
+/// A text stays in the line where it found room, and the next one takes the line below when that is free: a
+/// part of the movie shows them as the whole does, wherever it begins.
+TEST(Burn, LeavesTextsInTheirLinesWhereverAPartBegins) {
+    const Folder folder;
+    WriteFile(folder / "lines.srt", "1\n00:00:00,000 --> 00:00:01,000\nfirst\n\n"
+                                    "2\n00:00:00,500 --> 00:00:02,000\nsecond and longer\n\n"
+                                    "3\n00:00:01,200 --> 00:00:03,000\n3\n\n"
+                                    "4\n00:00:01,500 --> 00:00:02,500\nthe fourth\n\n");
+    const auto pictures = [&](const Args& options) {
+        EXPECT_EQ(Call(Join(Args{whole_movie::Make(true), folder / "out.mkv", "-y", "-q", "--video-codec",
+                                 "FFV1", "--no-audio", "--burn-subtitles", folder / "lines.srt"},
+                            options))
+                      .code,
+                  0);
+        return FfmpegReads(folder / "out.mkv", Words("-map 0:v:0 -f rawvideo -pix_fmt gray"));
+    };
+    constexpr std::size_t kPicture = 160 * 120;
+    const std::string whole = pictures({});
+    ASSERT_EQ(whole.size(), 30 * kPicture);
+    for (const std::size_t first : {7, 14, 17, 22})
+        EXPECT_TRUE(pictures({"--begin", fmt::format("{}.{}", first / 10, first % 10)}) ==
+                    whole.substr(first * kPicture))
+            << first;
+}
+
 TEST(Burn, ComesAndGoesWhileOnePictureStays) {
     const Folder folder;
     Ffmpeg(Join(Lavfi("color=black:s=160x120:r=0.1:d=40"), Words("-c:v ffv1"), Args{folder / "slides.mkv"}));
