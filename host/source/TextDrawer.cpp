@@ -2,11 +2,10 @@
 #include "ffmpeg/FilterLibrary.h"
 #include "host/sentence/Say.h"
 #include "host/source/CueDrawer.h"
-#include "host/source/MediaTime.h"
 #include "host/source/SourceError.h"
+#include "host/source/TextScript.h"
 
 #include <algorithm>
-#include <array>
 #include <cmath>
 #include <cstdlib>
 #include <cstring>
@@ -14,23 +13,13 @@
 #include <fmt/format.h>
 #include <fstream>
 #include <optional>
-#include <set>
 #include <system_error>
 #include <utility>
 
 namespace movieconv {
 namespace {
 
-constexpr int64_t kHundredth = kTicksPerSecond / 100; // the unit of the times in a script
 constexpr AVRational kMicrosecond{1, 1'000'000};
-constexpr int64_t kUnknownLength = 5 * kTicksPerSecond;
-
-struct Event {
-    int64_t begin; // hundredths
-    int64_t end;
-    std::string line; // "Layer,Style,Name,MarginL,MarginR,MarginV,Effect,Text" with the times left out
-    bool moves;       // is not the same at all times
-};
 
 /// A script and its fonts in a folder that lasts until the script has been read.
 class ScriptFolder {
@@ -91,96 +80,6 @@ std::string Quoted(const std::string& value) {
     return escape(escape(value, "\\':"), "\\'[],;");
 }
 
-std::string ScriptTime(int64_t hundredths) {
-    const auto seconds = hundredths / 100;
-    return fmt::format("{}:{:02}:{:02}.{:02}", seconds / 3600, seconds / 60 % 60, seconds % 60,
-                       hundredths % 100);
-}
-
-/// A line of text on its own must not end the event.
-std::string OneLine(std::string text) {
-    text.erase(std::remove(text.begin(), text.end(), '\r'), text.end());
-    for (std::size_t at = 0; (at = text.find('\n', at)) != std::string::npos;)
-        text.replace(at, 1, "\\N");
-    return text;
-}
-
-bool Moves(const std::string& line) {
-    constexpr std::array kMarks{"\\t(", "\\move", "\\fad", "\\k", "\\K", "Banner;", "Scroll "};
-    return std::any_of(kMarks.begin(), kMarks.end(),
-                       [&line](const char* mark) { return line.find(mark) != std::string::npos; });
-}
-
-/// The events of a list as one script has them, in the order of their begins.
-class Script {
-public:
-    explicit Script(const CueList& list) : decoder_(list.OpenDecoder({1, 1000})) {
-        for (const CueList::Cue& cue : list.cues)
-            Decode(cue);
-        std::stable_sort(events_.begin(), events_.end(),
-                         [](const Event& one, const Event& other) { return one.begin < other.begin; });
-        LastUpToNext();
-    }
-
-    const std::vector<Event>& Events() const { return events_; }
-
-    std::string Text() const {
-        std::string text;
-        if (decoder_->subtitle_header != nullptr)
-            text.assign(reinterpret_cast<const char*>(decoder_->subtitle_header),
-                        static_cast<std::size_t>(decoder_->subtitle_header_size));
-        while (!text.empty() && text.back() == '\0')
-            text.pop_back();
-        text += "\n[Events]\n"
-                "Format: Layer, Start, End, Style, Name, MarginL, MarginR, MarginV, Effect, Text\n";
-        for (const Event& event : events_) {
-            const std::size_t comma = event.line.find(',');
-            text += fmt::format("Dialogue: {},{},{}{}\n", event.line.substr(0, comma),
-                                ScriptTime(event.begin), ScriptTime(event.end), event.line.substr(comma));
-        }
-        return text;
-    }
-
-private:
-    void Decode(const CueList::Cue& cue) {
-        const av::Packet packet = av::CopyOf(*cue.packet);
-        packet->pts = packet->dts = 0;
-        AVSubtitle decoded{};
-        int got = 0;
-        av::CheckMemory(avcodec_decode_subtitle2(decoder_.get(), &decoded, &got, packet.get()));
-        for (unsigned i = 0; got != 0 && i < decoded.num_rects; ++i)
-            if (decoded.rects[i]->ass != nullptr)
-                Add(cue, decoded.rects[i]->ass);
-        avsubtitle_free(&decoded);
-    }
-
-    void Add(const CueList::Cue& cue, const std::string& coded) {
-        const auto hundredths = [](int64_t time) { return (time + kHundredth / 2) / kHundredth; };
-        const std::size_t order = coded.find(','); // of reading, which does not belong into a script
-        if (order == std::string::npos || coded.find(',', order + 1) == std::string::npos || cue.end < 0)
-            return;
-        const std::string line = OneLine(coded.substr(order + 1));
-        const int64_t begin = std::max<int64_t>(cue.begin, 0);
-        events_.push_back(
-            {hundredths(begin), hundredths(cue.end > begin ? cue.end : begin), line, Moves(line)});
-    }
-
-    void LastUpToNext() {
-        for (std::size_t i = 0; i < events_.size(); ++i) {
-            if (events_[i].end > events_[i].begin)
-                continue;
-            const auto next =
-                std::find_if(events_.begin() + static_cast<std::ptrdiff_t>(i), events_.end(),
-                             [&](const Event& other) { return other.begin > events_[i].begin; });
-            const int64_t latest = events_[i].begin + kUnknownLength / kHundredth;
-            events_[i].end = next != events_.end() ? std::min(next->begin, latest) : latest;
-        }
-    }
-
-    av::CodecContext decoder_;
-    std::vector<Event> events_;
-};
-
 class TextDrawer final : public CueDrawer {
 public:
     TextDrawer(const CueList& list, const PictureStreamInfo& pictures, const std::vector<FontFile>& fonts)
@@ -200,8 +99,9 @@ public:
     Canvas Draw(int64_t time) override {
         if (active_.empty())
             return {};
+        // Lest a part of the movie has texts in other lines than the whole.
         if (!std::exchange(placed_, true))
-            for (const int64_t begin : BeginsThatPlace())
+            for (const int64_t begin : script_.BeginsThatPlace(active_))
                 Drawn(begin * kHundredth);
         const av::Frame drawn = Drawn(time);
         return drawn ? Trimmed(drawn->data[0], drawn->linesize[0], width_, height_) : Canvas{};
@@ -212,7 +112,7 @@ public:
         if (AnythingMoves())
             return time;
         int64_t next = kNever;
-        for (const Event* event : active_)
+        for (const TextEvent* event : active_)
             next = std::min(next, event->end * kHundredth);
         if (next_ < script_.Events().size())
             next = std::min(next, script_.Events()[next_].begin * kHundredth);
@@ -222,10 +122,10 @@ public:
 private:
     /// Finds out what is to be seen at `time`.
     void Advance(int64_t time) {
-        const std::vector<Event>& events = script_.Events();
+        const std::vector<TextEvent>& events = script_.Events();
         const int64_t now = time / kHundredth;
         const auto ended = std::remove_if(active_.begin(), active_.end(),
-                                          [&](const Event* event) { return event->end <= now; });
+                                          [&](const TextEvent* event) { return event->end <= now; });
         changed_ = changed_ || ended != active_.end();
         active_.erase(ended, active_.end());
         for (; next_ < events.size() && events[next_].begin <= now; ++next_)
@@ -235,29 +135,9 @@ private:
             }
     }
 
-    /// When the texts began that are seen now, and those on which their places depend (hundredths, rising):
-    /// libass stacks a text upon what is seen as it appears and leaves it there. Drawn at these times, a
-    /// conversion that begins amid texts has them where one from the movie's begin has them.
-    std::set<int64_t> BeginsThatPlace() const {
-        std::set<int64_t> begins;
-        std::vector<const Event*> open = active_;
-        while (!open.empty()) {
-            const int64_t begin = open.back()->begin;
-            open.pop_back();
-            if (!begins.insert(begin).second)
-                continue;
-            for (const Event& other : script_.Events()) {
-                if (other.begin >= begin)
-                    break;
-                if (other.end > begin)
-                    open.push_back(&other);
-            }
-        }
-        return begins;
-    }
-
     bool AnythingMoves() const {
-        return std::any_of(active_.begin(), active_.end(), [](const Event* event) { return event->moves; });
+        return std::any_of(active_.begin(), active_.end(),
+                           [](const TextEvent* event) { return event->moves; });
     }
 
     /// Does `work` with the graph, whose errors are the source's.
@@ -302,13 +182,13 @@ private:
                        1, kMicrosecond);
     }
 
-    const Script script_;
+    const TextScript script_;
     const int width_;
     const int height_;
     const int shownWidth_;                 // with square pixels
     std::optional<av::FilterGraph> graph_; // unless there is nothing to draw
     std::size_t next_ = 0;
-    std::vector<const Event*> active_;
+    std::vector<const TextEvent*> active_;
     bool changed_ = false; // since it was asked for last
     bool placed_ = false;  // the texts that are seen from the first picture on
 };
