@@ -67,20 +67,20 @@ double GifRate(double rate) {
 }
 
 std::optional<double> PreferredQuality(const Preferences& preferences, uint32_t codec, int height) {
-    const Steps<double>* qualities = QualityScaleOf(codec) ? preferences.QualitiesOf(codec) : nullptr;
+    const Steps<double>* qualities = QualityRangeOf(codec) ? preferences.QualitiesOf(codec) : nullptr;
     return qualities != nullptr ? qualities->At(height) : std::nullopt;
 }
 
-/// Throws Failure when the codec has no scale or another one.
+/// Throws Failure when the codec has no range or another one.
 void RequireQuality(uint32_t codec, double quality) {
-    const std::optional<QualityScale> scale = QualityScaleOf(codec);
-    if (!scale) {
+    const std::optional<QualityRange> range = QualityRangeOf(codec);
+    if (!range) {
         throw Failure(Category::kRequest,
                       Say("\"{}\" has no constant quality; give it a bit rate", CodeName(codec)));
     }
-    if (!(quality >= scale->best && quality <= scale->worst)) { // nor what is no number
+    if (!(quality >= range->best && quality <= range->worst)) { // nor what is no number
         throw Failure(Category::kRequest, Say("the quality of \"{}\" goes from {} (best) to {}, not to {}",
-                                              CodeName(codec), scale->best, scale->worst, quality));
+                                              CodeName(codec), range->best, range->worst, quality));
     }
 }
 
@@ -164,7 +164,7 @@ bool HasRates(const Request& request, const FileFormatInfo& format, const Source
     if (!source.pictures || format.bHasVideo == 0)
         return true;
     const PictureCoding plan = PlanPictures(request, format, *source.pictures);
-    return !plan.quality && QualityScaleOf(plan.codec); // what has no scale loses nothing
+    return !plan.quality && QualityRangeOf(plan.codec); // what has no scale loses nothing
 }
 
 SoundCoding PlanSound(const Request& request, const FileFormatInfo& format, const SoundStreamInfo& source) {

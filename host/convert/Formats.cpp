@@ -56,8 +56,8 @@ std::optional<uint32_t> ParseCode(std::string_view text) {
     return FourCC(code[0], code[1], code[2], code[3]);
 }
 
-std::optional<QualityScale> QualityScaleOf(uint32_t videoCodec) {
-    QualityScale scale{};
+std::optional<QualityRange> QualityRangeOf(uint32_t videoCodec) {
+    QualityRange scale{};
     return MWGetQualityScale(videoCodec, &scale.best, &scale.worst) != 0 ? std::optional(scale)
                                                                          : std::nullopt;
 }

@@ -29,14 +29,14 @@ bool SameIgnoringCase(std::string_view one, std::string_view other);
 /// "H264" from "h264", "AAC " from "aac". Nothing for more than four characters or none.
 std::optional<uint32_t> ParseCode(std::string_view text);
 
-/// A codec's scale of constant quality, where lower is better.
-struct QualityScale {
+/// The range of a codec's constant quality, where lower is better.
+struct QualityRange {
     double best;
     double worst;
 };
 
 /// Nothing for codecs that have none, such as those that lose nothing.
-std::optional<QualityScale> QualityScaleOf(uint32_t videoCodec);
+std::optional<QualityRange> QualityRangeOf(uint32_t videoCodec);
 
 /// The characters of a code, without the spaces at its end.
 std::string CodeName(uint32_t code);

@@ -185,7 +185,7 @@ Request FitIntoSize(Request request, const SourceInfo& source) {
     const double length = std::max(LengthToConvert(request, source), 0.001);
     const bool pictures = source.pictures && format.bHasVideo != 0;
     const bool sound = source.sound && format.bHasAudio != 0;
-    if (pictures && !QualityScaleOf(PictureCodecFor(request, format)))
+    if (pictures && !QualityRangeOf(PictureCodecFor(request, format)))
         throw Failure(Category::kRequest, Say("a codec without a bit rate cannot keep below a size"));
     const bool packets = Has(format, kWriterFormatSmallPackets);
     const double tracks = SoundTracks(request, format, source);

@@ -89,7 +89,7 @@ TEST_F(RunnerTest, MovesThePresetsOwnQuality) {
                 EXPECT_EQ(QualityOf(preset, codec, height, usual), own);
                 EXPECT_GT(QualityOf(preset, codec, height, 0), own);
                 EXPECT_LE(QualityOf(preset, codec, height, 100), own);
-                const auto scale = movieconv::QualityScaleOf(codec);
+                const auto scale = movieconv::QualityRangeOf(codec);
                 EXPECT_LE(*QualityOf(preset, codec, height, 0), scale->worst);
                 EXPECT_GE(*QualityOf(preset, codec, height, 100), scale->best);
             }

@@ -63,11 +63,11 @@ constexpr int kUsualHeight = 1080; // for which a preset's place on the window's
 struct Scale {
     double centre; // which is 50 in the window
     double span;   // lower is better
-    QualityScale whole;
+    QualityRange whole;
 };
 
 std::optional<Scale> ScaleOf(uint32_t codec) {
-    const std::optional<QualityScale> whole = QualityScaleOf(codec);
+    const std::optional<QualityRange> whole = QualityRangeOf(codec);
     if (!whole)
         return std::nullopt;
     const double width = whole->worst - whole->best;
