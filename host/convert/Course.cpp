@@ -343,6 +343,10 @@ void Course::ReportComplaints() {
         Complain(Warning::Kind::kLoss, {loss});
     Complain(Warning::Kind::kLoss, movie_.Losses());
     Complain(Warning::Kind::kSource, movie_.Complaints());
+    if (!request_.piece)
+        for (const std::string& file : files_.WithoutPictures())
+            observer_.Warned({Warning::Kind::kLoss,
+                              Say("\"{}\" has no pictures: none came from its part of the source", file)});
 }
 
 void Course::Complain(Warning::Kind kind, const std::vector<Sentence>& complaints) {

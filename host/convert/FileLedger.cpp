@@ -118,6 +118,8 @@ void FileLedger::EnterClosed(const WriterWatch::News& news) {
         failure_.emplace(Category::kOutput, Say("\"{}\" has {} bytes, but {} were written into it",
                                                 file.szPath, news.identity.size, file.llBytesWritten));
     }
+    if (file.nWidth > 0 && file.llPicturesReceived == 0)
+        withoutPictures_.emplace_back(file.szPath);
     bytes_ += file.llBytesWritten;
     observer_.Closed({opened_, file.szPath, file.dVideoWritten, file.dAudioWritten, file.llBytesWritten,
                       file.llPicturesReceived});

@@ -33,6 +33,9 @@ public:
     /// Why not everything that was closed stands under its name, a sentence; nothing when it does.
     std::optional<Sentence> FindMissing() const;
 
+    /// The complete files with a track for pictures that none came into.
+    const std::vector<std::string>& WithoutPictures() const { return withoutPictures_; }
+
     /// What went wrong first; nothing when all is well.
     const std::optional<Failure>& FirstFailure() const { return failure_; }
 
@@ -49,6 +52,7 @@ private:
     int opened_;
     int64_t begin_ = 0; // of the file opened next
     std::vector<Entry> complete_;
+    std::vector<std::string> withoutPictures_;
     int64_t bytes_ = 0;
     std::optional<double> finishing_;
     std::optional<Failure> failure_;

@@ -104,6 +104,17 @@ TEST(UnusualPictures, WhatTheyLoseIsTold) {
     }
 }
 
+TEST(UnusualPictures, AFileThatNoneCameIntoIsTold) {
+    const Folder folder;
+    const std::string late = Make("late.mkv", Join(Join(Words("-itsoffset 2"), CountedPictures(1)),
+                                                   Join(Lavfi("sine=d=3"), Words("-c:v ffv1 -c:a flac"))));
+    for (const std::string end : {"1", "3"}) {
+        const Result result = Call({late, folder / "o.mp4", "-y", "--length", end});
+        EXPECT_EQ(result.code, 0);
+        EXPECT_EQ(result.err.find("o.mp4\" has no pictures") != std::string::npos, end == "1") << result.err;
+    }
+}
+
 /// A movie whose first picture comes with three bytes of closed captions.
 std::string Captioned(const std::string& captions) {
     std::string movie = ReadFile(Make("captioned.h264", Join(CountedPictures(0.2), Args{"-c:v", "libx264"})));

@@ -1289,6 +1289,10 @@
         <source>its index is at its end, and a pipe cannot be sought</source>
         <translation>sein Index steht am Ende, und in einer Pipe lässt sich nicht zurückspringen</translation>
     </message>
+    <message>
+        <source>&quot;{}&quot; has no pictures: none came from its part of the source</source>
+        <translation>„{}“ hat keine Bilder: aus seinem Teil der Quelle kamen keine</translation>
+    </message>
 </context>
 <context>
     <name>LogShare</name>
