@@ -101,7 +101,8 @@ std::string Zsh(const std::vector<OptionEntry>& options) {
         const std::string rest = "[" + Escape(option.help, "[]\\:") + "]" + ZshValue(option);
         const std::string mentions = option.repeatable ? "*" : fmt::format("({})", fmt::join(names, " "));
         for (const std::string& name : names)
-            fmt::format_to(std::back_inserter(specs), "    {} \\\n", Quoted(mentions + name + rest));
+            fmt::format_to(std::back_inserter(specs), "    {} \\\n",
+                           Quoted(fmt::format("{}{}{}", mentions, name, rest)));
     }
     return fmt::format("#compdef movieconv\n"
                        "# Completion of movieconv for zsh.\n"
