@@ -46,7 +46,7 @@ TEST(RunLock, IsNotGivenWhileAnotherUserHasIt) {
     if (seteuid(kNobody) != 0)
         GTEST_SKIP() << "only root can be somebody else";
     const std::string refusal = Refusal(folder / "list");
-    seteuid(0);
+    ASSERT_EQ(seteuid(0), 0);
     EXPECT_NE(refusal.find("another run"), std::string::npos) << refusal;
     held.reset();
     EXPECT_EQ(Refusal(folder / "list"), "");
