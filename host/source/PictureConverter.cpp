@@ -3,11 +3,13 @@
 #include <algorithm>
 #include <cmath>
 #include <cstddef>
+#include <cstdint>
 #include <new>
 #include <utility>
 
 extern "C" {
 #include <libavutil/imgutils.h>
+#include <libavutil/opt.h>
 }
 
 namespace movieconv {
@@ -187,24 +189,45 @@ PictureConverter::Size PictureConverter::SizeWithin(const Size& whole, const AVF
                            : Size{even(picture.width * widening * scaleY), whole.height};
 }
 
+/// The range is told before the rest is set up: swscale then decides whether pictures that keep their size
+/// are copied, levels and all, and what it is told later does not change that.
+av::Scaler PictureConverter::NewScaler(const Scaling& scaling) const {
+    av::Scaler scaler(sws_alloc_context());
+    if (!scaler)
+        return nullptr;
+    const std::pair<const char*, int64_t> options[] = {
+        {"srcw", scaling.from.width},   {"srch", scaling.from.height},
+        {"src_format", scaling.format}, {"src_range", scaling.fullRange && !IsRgb(scaling.format) ? 1 : 0},
+        {"dstw", scaling.to.width},     {"dsth", scaling.to.height},
+        {"dst_format", format_},        {"sws_flags", SWS_BICUBIC | SWS_ACCURATE_RND},
+    };
+    for (const auto& [name, value] : options)
+        av_opt_set_int(scaler.get(), name, value, 0);
+    if (sws_init_context(scaler.get(), nullptr, nullptr) < 0)
+        return nullptr;
+    return scaler;
+}
+
 av::Frame PictureConverter::Scale(const AVFrame& picture) {
     const auto format = static_cast<AVPixelFormat>(picture.format);
     const Size whole = WholeSize(picture);
     const Size size = SizeWithin(whole, picture);
-    scaler_.reset(sws_getCachedContext(scaler_.release(), picture.width, picture.height, format, size.width,
-                                       size.height, format_, SWS_BICUBIC | SWS_ACCURATE_RND, nullptr, nullptr,
-                                       nullptr));
+    const Scaling scaling{{picture.width, picture.height}, format, IsFullRange(picture), size};
+    if (!scaler_ || scaling_ != scaling) {
+        scaler_ = NewScaler(scaling);
+        scaling_ = scaling;
+    }
     av::Frame converted = NewPicture(format_, size.width, size.height);
     if (!scaler_)
         return nullptr;
     const int* coefficients = sws_getCoefficients(IsRgb(format) ? rgbMatrix_ : picture.colorspace);
-    sws_setColorspaceDetails(scaler_.get(), coefficients, IsFullRange(picture) ? 1 : 0, coefficients, 0, 0,
+    sws_setColorspaceDetails(scaler_.get(), coefficients, scaling.fullRange ? 1 : 0, coefficients, 0, 0,
                              1 << 16, 1 << 16);
     const int rows = sws_scale(scaler_.get(), picture.data, picture.linesize, 0, picture.height,
                                converted->data, converted->linesize);
     if (rows <= 0)
         return nullptr;
-    narrowed_ = narrowed_ || (IsFullRange(picture) && !IsRgb(format));
+    narrowed_ = narrowed_ || (scaling.fullRange && !IsRgb(format));
     return size == whole ? std::move(converted) : Bordered(*converted, whole.width, whole.height);
 }
 

@@ -25,15 +25,25 @@ public:
 
 private:
     struct Size {
-        int width;
-        int height;
+        int width = 0;
+        int height = 0;
         bool operator==(const Size&) const = default;
+    };
+
+    /// What a scaler is made for.
+    struct Scaling {
+        Size from;
+        AVPixelFormat format = AV_PIX_FMT_NONE;
+        bool fullRange = false;
+        Size to;
+        bool operator==(const Scaling&) const = default;
     };
 
     static Size StoredSize(const PictureStreamInfo& stream);
     Size WholeSize(const AVFrame& picture) const;
     double Widening(const AVFrame& picture) const;
     Size SizeWithin(const Size& whole, const AVFrame& picture) const;
+    av::Scaler NewScaler(const Scaling& scaling) const;
     av::Frame Scale(const AVFrame& picture);
     av::Frame Turn(const AVFrame& picture) const;
     void Cut(AVFrame& picture) const;
@@ -47,6 +57,7 @@ private:
     const Size stored_;
     const bool oneSize_; // otherwise pictures of the same shape of pixels keep their own size
     av::Scaler scaler_;
+    Scaling scaling_; // of scaler_
     bool narrowed_ = false;
 };
 

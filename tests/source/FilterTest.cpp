@@ -108,6 +108,33 @@ TEST(Filters, TellThatFullRangeBecomesTheUsualOne) {
     }
 }
 
+/// White of full range is that of the usual one, also where layout and size stay and the format of the pixels
+/// does not say the range.
+TEST(Filters, BringFullRangeToTheUsualOne) {
+    const Args white{"-f", "lavfi", "-i", "color=white:s=64x48:r=25:d=0.2,format=yuv420p,geq=255:128:128"};
+    const Args full{"-color_range", "pc"};
+    const std::string vp9 =
+        Make("white.webm", Join(white, full, Args{"-c:v", "libvpx-vp9", "-lossless", "1"}));
+    const Args deepCoded{"-pix_fmt", "yuv420p10le",  "-c:v",
+                         "libx265",  "-x265-params", "log-level=none:lossless=1:range=full"};
+    const Args deepWhite{"-f", "lavfi", "-i",
+                         "color=white:s=64x48:r=25:d=0.2,format=yuv420p10le,geq=1023:512:512"};
+    const std::string hevc = Make("white-deep.mkv", Join(deepWhite, deepCoded));
+    for (const std::string& path : {vp9, hevc})
+        for (const bool deep : {false, true}) {
+            SCOPED_TRACE(path + (deep ? " deep" : ""));
+            movieconv::SourceChoice choice;
+            choice.deep = deep;
+            Movie movie(path, choice);
+            const VideoImage* image = movie.Pictures()->GetCurrentImage();
+            ASSERT_NE(image, nullptr);
+            const bool isDeep = image->nFormat == kPictureFormatPlanar420Deep;
+            EXPECT_EQ(isDeep, deep && path == hevc);
+            const int luma = isDeep ? reinterpret_cast<const uint16_t*>(image->pY)[8] : image->pY[8];
+            EXPECT_NEAR(luma, isDeep ? 940 : 235, isDeep ? 4 : 1); // swscale is off by 3 of 1023
+        }
+}
+
 TEST(Filters, BringHdrToTheLightOfUsualDisplays) {
     for (const char* transfer : {"16", "18"}) { // PQ, HLG
         SCOPED_TRACE(transfer);
