@@ -100,9 +100,9 @@ AVPixelFormat ChooseDepth(const PictureCodec& codec, const WriterOptions& option
 PictureSettings MakePictureSettings(const EncodeParam& param, const VideoFormat& source,
                                     const PictureCodec& codec, const WriterOptions& options) {
     PictureSettings settings{};
-    settings.width = FirstPositive(param.nWidth, source.nWidth, 0);
-    settings.height = FirstPositive(param.nHeight, source.nHeight, 0);
-    if (param.nWidth < 0 || param.nHeight < 0 ||
+    settings.width = param.nWidth != 0 ? param.nWidth : std::max(0, source.nWidth);
+    settings.height = param.nHeight != 0 ? param.nHeight : std::max(0, source.nHeight);
+    if (settings.width < 0 || settings.height < 0 ||
         av_image_check_size(static_cast<unsigned>(settings.width), static_cast<unsigned>(settings.height), 0,
                             nullptr) < 0)
         throw WriterFailure(kWriterErrorArgument, "Pictures of " + std::to_string(settings.width) + "x" +

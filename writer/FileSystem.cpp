@@ -158,6 +158,11 @@ std::string ResolveTarget(const std::string& path) {
 
 std::unique_ptr<ByteFile> CreateBeside(FileSystem& files, const std::string& target, std::string& path,
                                        int& error) {
+    struct stat status {};
+    if (lstat(target.c_str(), &status) != 0 && errno == ENAMETOOLONG) { // its temporary name would fit
+        error = ENAMETOOLONG;
+        return nullptr;
+    }
     const std::string name = text::NameOf(target);
     const std::string folder = target.substr(0, target.size() - name.size());
     const long told = pathconf(text::FolderOf(target).c_str(), _PC_NAME_MAX);

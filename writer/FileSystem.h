@@ -61,7 +61,8 @@ int CheckTarget(const std::string& path);
 std::string ResolveTarget(const std::string& path);
 
 /// Creates a file beside `target`, which it is to replace: its name is that of the target with PartialSuffix,
-/// cut where a name would be longer than file systems allow. Null with `error` set on failure.
+/// cut where a name would be longer than file systems allow. Null with `error` set on failure, which a target
+/// is whose own name is too long.
 std::unique_ptr<ByteFile> CreateBeside(FileSystem& files, const std::string& target, std::string& path,
                                        int& error);
 

@@ -7,6 +7,7 @@
 #include <algorithm>
 #include <atomic>
 #include <cerrno>
+#include <climits>
 #include <cstddef>
 #include <filesystem>
 #include <memory>
@@ -114,6 +115,17 @@ TEST(MediaWriter, RefusesTargetsThatAreNotFiles) {
     EXPECT_EQ(TestMovie().Create(folder / "missing/movie"), nullptr);
     EXPECT_EQ(Latest().nError, kWriterErrorOpen);
     EXPECT_EQ(Latest().nSystemError, ENOENT);
+    EXPECT_EQ(TestMovie().Create(folder / (std::string(NAME_MAX, 'n') + ".mp4")), nullptr);
+    EXPECT_EQ(Latest().nSystemError, ENAMETOOLONG); // at once, not when the movie is to take the name
+    EXPECT_TRUE(folder.Names().empty());
+}
+
+TEST(MediaWriter, NamesTheSizeThatItWasAskedFor) {
+    const Folder folder;
+    TestMovie movie;
+    movie.param.nWidth = -160;
+    EXPECT_EQ(movie.Create(folder / "movie"), nullptr);
+    EXPECT_NE(std::string(Latest().szWhat).find("-160x"), std::string::npos) << Latest().szWhat;
 }
 
 TEST(MediaWriter, KeepsAnExistingFileWhenAsked) {
