@@ -65,7 +65,7 @@ private:
     // The taking thread's.
     Planes taken_;
     std::optional<PictureFilter> filter_;
-    PictureConverter converter_{PictureStreamInfo{}, false, false};
+    PictureConverter converter_{PictureStreamInfo{}, SourceChoice{}, false};
     int matrix_ = SWS_CS_ITU601; // FFmpeg's SWS_CS_...
     av::Scaler scaler_;          // where it is another one
 };

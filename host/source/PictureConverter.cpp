@@ -1,6 +1,7 @@
 #include "host/source/PictureConverter.h"
 
 #include <algorithm>
+#include <array>
 #include <cmath>
 #include <cstddef>
 #include <cstdint>
@@ -57,6 +58,19 @@ bool IsNearlySame(double shape, double other) {
 
 bool IsFullRange(const AVFrame& picture) {
     return picture.color_range == AVCOL_RANGE_JPEG || picture.format == AV_PIX_FMT_YUVJ420P;
+}
+
+/// Whether luma and chroma of that matrix are sums of red, green and blue, whose coefficients the scaler
+/// knows.
+bool IsLinear(int matrix) {
+    constexpr std::array kLinear{AVCOL_SPC_BT709,     AVCOL_SPC_FCC,       AVCOL_SPC_BT470BG,
+                                 AVCOL_SPC_SMPTE170M, AVCOL_SPC_SMPTE240M, AVCOL_SPC_BT2020_NCL};
+    return std::find(kLinear.begin(), kLinear.end(), matrix) != kLinear.end();
+}
+
+bool HaveSameCoefficients(int matrix, int other) {
+    return std::equal(sws_getCoefficients(matrix), sws_getCoefficients(matrix) + 4,
+                      sws_getCoefficients(other));
 }
 
 /// Copies a plane so that target pixel (x, y) is source pixel `origin` + x * `stepX` + y * `stepY`; the steps
@@ -116,12 +130,14 @@ void TurnPlanes(const AVFrame& picture, AVFrame& turned, int quarterTurns, bool 
 
 } // namespace
 
-PictureConverter::PictureConverter(const PictureStreamInfo& stream, bool deep, bool drawnInto)
+PictureConverter::PictureConverter(const PictureStreamInfo& stream, const SourceChoice& choice,
+                                   bool drawnInto)
     : quarterTurns_(stream.quarterTurns),
       mirrored_(stream.mirrored),
       crop_(stream.crop),
-      rgbMatrix_(UsualMatrix(stream)),
-      format_(deep ? AV_PIX_FMT_YUV420P10 : AV_PIX_FMT_YUV420P),
+      matrix_(HandedOutMatrix(stream, choice.keepHdr)),
+      matrixByPicture_(stream.matrixByPicture),
+      format_(choice.deep && stream.depth > 8 ? AV_PIX_FMT_YUV420P10 : AV_PIX_FMT_YUV420P),
       codedAspect_(stream.codedAspect),
       stored_(StoredSize(stream)),
       oneSize_(drawnInto || !crop_.CutsNothing()) {}
@@ -129,7 +145,7 @@ PictureConverter::PictureConverter(const PictureStreamInfo& stream, bool deep, b
 av::Frame PictureConverter::Convert(AVFrame& picture) {
     const bool hasSize = WholeSize(picture) == Size{picture.width, picture.height} && Widening(picture) == 1;
     av::Frame converted;
-    if (picture.format == format_ && !IsFullRange(picture) && hasSize) {
+    if (picture.format == format_ && !IsFullRange(picture) && hasSize && MatrixOf(picture) == matrix_) {
         converted = av::NewFrame();
         av_frame_move_ref(converted.get(), &picture);
     } else {
@@ -189,6 +205,16 @@ PictureConverter::Size PictureConverter::SizeWithin(const Size& whole, const AVF
                            : Size{even(picture.width * widening * scaleY), whole.height};
 }
 
+/// By which the picture's luma and chroma stand for its colours: the stream's, unless the picture may state
+/// another one, as in a recording where one programme follows another. What a container states holds for all
+/// pictures.
+int PictureConverter::MatrixOf(const AVFrame& picture) const {
+    const int stated = picture.colorspace;
+    const bool isAnother = matrixByPicture_ && !IsRgb(static_cast<AVPixelFormat>(picture.format)) &&
+                           IsLinear(stated) && IsLinear(matrix_) && !HaveSameCoefficients(stated, matrix_);
+    return isAnother ? stated : matrix_;
+}
+
 /// The range is told before the rest is set up: swscale then decides whether pictures that keep their size
 /// are copied, levels and all, and what it is told later does not change that.
 av::Scaler PictureConverter::NewScaler(const Scaling& scaling) const {
@@ -205,6 +231,8 @@ av::Scaler PictureConverter::NewScaler(const Scaling& scaling) const {
         av_opt_set_int(scaler.get(), name, value, 0);
     if (sws_init_context(scaler.get(), nullptr, nullptr) < 0)
         return nullptr;
+    sws_setColorspaceDetails(scaler.get(), sws_getCoefficients(scaling.matrix), scaling.fullRange ? 1 : 0,
+                             sws_getCoefficients(matrix_), 0, 0, 1 << 16, 1 << 16);
     return scaler;
 }
 
@@ -212,7 +240,8 @@ av::Frame PictureConverter::Scale(const AVFrame& picture) {
     const auto format = static_cast<AVPixelFormat>(picture.format);
     const Size whole = WholeSize(picture);
     const Size size = SizeWithin(whole, picture);
-    const Scaling scaling{{picture.width, picture.height}, format, IsFullRange(picture), size};
+    const Scaling scaling{
+        {picture.width, picture.height}, format, IsFullRange(picture), MatrixOf(picture), size};
     if (!scaler_ || scaling_ != scaling) {
         scaler_ = NewScaler(scaling);
         scaling_ = scaling;
@@ -220,9 +249,6 @@ av::Frame PictureConverter::Scale(const AVFrame& picture) {
     av::Frame converted = NewPicture(format_, size.width, size.height);
     if (!scaler_)
         return nullptr;
-    const int* coefficients = sws_getCoefficients(IsRgb(format) ? rgbMatrix_ : picture.colorspace);
-    sws_setColorspaceDetails(scaler_.get(), coefficients, scaling.fullRange ? 1 : 0, coefficients, 0, 0,
-                             1 << 16, 1 << 16);
     const int rows = sws_scale(scaler_.get(), picture.data, picture.linesize, 0, picture.height,
                                converted->data, converted->linesize);
     if (rows <= 0)

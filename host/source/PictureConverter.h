@@ -11,10 +11,10 @@ namespace movieconv {
 
 class PictureConverter {
 public:
-    /// Pictures of such a stream are mirrored, turned and cropped as it says. `deep`: they get 10 bits. Where
-    /// they are cropped or `drawnInto`, those of other sizes are brought to the one that the stream tells,
-    /// for which the places are meant; and those that tell another shape of their pixels always.
-    PictureConverter(const PictureStreamInfo& stream, bool deep, bool drawnInto);
+    /// Pictures of such a stream are mirrored, turned and cropped as it says. Where they are cropped or
+    /// `drawnInto`, those of other sizes are brought to the one that the stream tells, for which the places
+    /// are meant; and those that tell another shape of their pixels always.
+    PictureConverter(const PictureStreamInfo& stream, const SourceChoice& choice, bool drawnInto);
 
     /// The picture in the engine's form. One that has it already is passed on without a copy. Null when it
     /// cannot be converted, as with a damaged size.
@@ -35,6 +35,7 @@ private:
         Size from;
         AVPixelFormat format = AV_PIX_FMT_NONE;
         bool fullRange = false;
+        int matrix = kMatrixUnstated;
         Size to;
         bool operator==(const Scaling&) const = default;
     };
@@ -43,6 +44,7 @@ private:
     Size WholeSize(const AVFrame& picture) const;
     double Widening(const AVFrame& picture) const;
     Size SizeWithin(const Size& whole, const AVFrame& picture) const;
+    int MatrixOf(const AVFrame& picture) const;
     av::Scaler NewScaler(const Scaling& scaling) const;
     av::Frame Scale(const AVFrame& picture);
     av::Frame Turn(const AVFrame& picture) const;
@@ -51,7 +53,8 @@ private:
     const int quarterTurns_;
     const bool mirrored_;
     const Crop crop_;
-    const int rgbMatrix_;
+    const int matrix_; // of what is handed out
+    const bool matrixByPicture_;
     const AVPixelFormat format_;
     const AVRational codedAspect_; // of the stream's pictures, as they tell it
     const Size stored_;

@@ -66,7 +66,8 @@ struct PictureStreamInfo {
     bool fullRange = false;
     int colorPrimaries = 2; ///< As in ISO/IEC 23091-2; 2: not stated.
     int colorTransfer = 2;
-    int colorMatrix = 2; ///< 0 of all RGB pictures and of no others.
+    int colorMatrix = 2;          ///< 0 of all RGB pictures and of no others.
+    bool matrixByPicture = false; ///< Each picture tells its own; the container has no word for all.
     std::optional<MasteringDisplay> masteringDisplay;
     std::optional<LightLevel> lightLevel;
     bool dolbyVision = false;

@@ -187,6 +187,7 @@ PictureStreamInfo DescribePictures(AVFormatContext& context, AVStream* stream) {
     info.colorPrimaries = parameters.color_primaries;
     info.colorTransfer = parameters.color_trc;
     info.colorMatrix = MatrixOf(parameters);
+    info.matrixByPicture = (context.iformat->flags & AVFMT_TS_DISCONT) != 0;
     ReadSideData(stream, info);
     return info;
 }

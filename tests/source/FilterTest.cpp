@@ -1,6 +1,7 @@
 // Interlaced, HDR and bordered pictures, measured where they are handed to the engine.
 #include "host/source/CropDetection.h"
 #include "host/source/Movie.h"
+#include "tests/support/Folder.h"
 #include "tests/support/Inspect.h"
 #include "tests/support/TestMovies.h"
 
@@ -133,6 +134,32 @@ TEST(Filters, BringFullRangeToTheUsualOne) {
             const int luma = isDeep ? reinterpret_cast<const uint16_t*>(image->pY)[8] : image->pY[8];
             EXPECT_NEAR(luma, isDeep ? 940 : 235, isDeep ? 4 : 1); // swscale is off by 3 of 1023
         }
+}
+
+/// In a recording of two programmes, of which the second one states another matrix.
+TEST(Filters, KeepColoursWhereTheMatrixChanges) {
+    const auto red = [](const char* name, const char* matrix, const char* label) {
+        return ReadFile(
+            Make(name, Join(Lavfi("color=red:s=64x48:r=25:d=0.2,format=gbrp,scale=out_color_matrix=" +
+                                  std::string(matrix) + ":out_range=tv,format=yuv420p"),
+                            Args{"-colorspace", label, "-c:v", "mpeg2video", "-q:v", "1"})));
+    };
+    const Folder folder;
+    WriteFile(folder / "both.ts",
+              red("red709.ts", "bt709", "bt709") + red("red601.ts", "bt601", "smpte170m"));
+    for (const bool deep : {false, true}) {
+        Movie movie(folder / "both.ts", {.deep = deep});
+        int pictures = 0;
+        do {
+            const VideoImage* image = movie.Pictures()->GetCurrentImage();
+            ASSERT_NE(image, nullptr);
+            EXPECT_NEAR(image->pY[8], 63, 1) << pictures;
+            EXPECT_NEAR(image->pU[8], 102, 1) << pictures;
+            EXPECT_NEAR(image->pV[8], 240, 1) << pictures;
+            ++pictures;
+        } while (movie.Pictures()->DecodeNext(1) == 1);
+        EXPECT_EQ(pictures, 10);
+    }
 }
 
 TEST(Filters, BringHdrToTheLightOfUsualDisplays) {
