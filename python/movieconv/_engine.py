@@ -267,6 +267,8 @@ class _Sound:
     def _bytes(self, samples: Any) -> bytes:
         if numpy is not None and isinstance(samples, numpy.ndarray):
             if samples.dtype.kind == "f":
+                if numpy.isnan(samples).any():
+                    raise ValueError("A block of sound has samples that are no numbers.")
                 samples = numpy.clip(numpy.rint(samples * 32767.0), -32768, 32767).astype("<i2")
             elif samples.dtype != numpy.int16:
                 raise TypeError(f"Sound is int16 or floating point, not {samples.dtype}.")
@@ -295,6 +297,13 @@ def _writer_set() -> Iterator[int]:
         engine.MWUnregisterOptions(number)
 
 
+def _positive(name: str, value: Any) -> int:
+    """As the library takes it, whose field would silently take another number of more than 31 bits."""
+    if not 0 < value < 2**31:
+        raise ValueError(f"The {name} is above 0 and below 2**31, not {value}.")
+    return int(value)
+
+
 def _parameters(path: str, options: dict[str, Any]) -> lib.EncodeParam:
     param = lib.EncodeParam()
     if _engine().MCEncodeParamForFile(path, c.byref(param)) == 0:
@@ -304,9 +313,9 @@ def _parameters(path: str, options: dict[str, Any]) -> lib.EncodeParam:
             setattr(param, field, lib.fourcc(options[name]))
     for name, field in (("video_bitrate", "nVideoBitrate"), ("audio_bitrate", "nAudioBitrate")):
         if options[name] is not None:
-            setattr(param, field, int(options[name]))
+            setattr(param, field, _positive(name, options[name]))
     if options["output_size"] is not None:
-        param.nWidth, param.nHeight = options["output_size"]
+        param.nWidth, param.nHeight = (_positive("output_size", side) for side in options["output_size"])
     return param
 
 
@@ -357,8 +366,8 @@ def write(
         (n, channels), or bytes of 16-bit little-endian samples.
     rate, sample_rate, channels: above 0.
     duration: the length in seconds if it is known, for `progress`.
-    output_size, codecs, file_format (four-character codes as in docs/decoders.md), bitrates (bits a second): what
-        the extension of `path` chooses, and the pictures' size, unless given.
+    output_size, codecs, file_format (four-character codes as in docs/decoders.md), bitrates (bits a second; as sizes
+        above 0): what the extension of `path` chooses, and the pictures' size, unless given.
     progress: called now and then; returning False ends the movie, which is finished as it is.
 
     The iterables are read on a thread of the library's. What they or `progress` raise is raised here, and so is

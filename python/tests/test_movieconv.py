@@ -77,6 +77,9 @@ def test_errors_are_exceptions_with_a_sentence(tmp_path):
     for arguments in (dict(pictures=[]), dict(), dict(pictures=[b"x"]), dict(pictures=pictures(1), file_format="")):
         with pytest.raises(ValueError):
             movieconv.write(tmp_path / "out.mp4", **arguments)
+    with pytest.raises(ValueError, match="no numbers"):
+        movieconv.write(tmp_path / "no-numbers.wav", sound=[numpy.full(480, numpy.nan)])
+    (tmp_path / "no-numbers.wav").unlink(missing_ok=True)
     with pytest.raises(ValueError, match="extension"):
         movieconv.write(tmp_path / "out.txt", pictures(1))
     assert list(tmp_path.iterdir()) == []
@@ -84,7 +87,8 @@ def test_errors_are_exceptions_with_a_sentence(tmp_path):
 
 @pytest.mark.parametrize("wrong", [
     dict(rate=0), dict(rate=-1), dict(rate=float("nan")), dict(rate=float("inf")), dict(sample_rate=0),
-    dict(channels=0), dict(size=(0, 48)), dict(sample_rate=2**32)])
+    dict(channels=0), dict(size=(0, 48)), dict(sample_rate=2**32), dict(video_bitrate=2**32 + 500_000),
+    dict(audio_bitrate=-1), dict(audio_bitrate=float("nan")), dict(output_size=(2**32 + 64, 48))])
 def test_what_makes_no_movie_is_told_by_its_name(tmp_path, wrong):
     with pytest.raises(ValueError, match="above 0"):
         movieconv.write(tmp_path / "out.mp4", **{"pictures": pictures(2), "sound": tone(0.1), **wrong})
