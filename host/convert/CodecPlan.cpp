@@ -164,7 +164,7 @@ bool HasRates(const Request& request, const FileFormatInfo& format, const Source
     if (!source.pictures || format.bHasVideo == 0)
         return true;
     const PictureCoding plan = PlanPictures(request, format, *source.pictures);
-    return !plan.quality && QualityRangeOf(plan.codec); // what has no scale loses nothing
+    return !plan.quality && QualityRangeOf(plan.codec); // what has no range loses nothing
 }
 
 SoundCoding PlanSound(const Request& request, const FileFormatInfo& format, const SoundStreamInfo& source) {

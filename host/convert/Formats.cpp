@@ -57,8 +57,8 @@ std::optional<uint32_t> ParseCode(std::string_view text) {
 }
 
 std::optional<QualityRange> QualityRangeOf(uint32_t videoCodec) {
-    QualityRange scale{};
-    return MWGetQualityScale(videoCodec, &scale.best, &scale.worst) != 0 ? std::optional(scale)
+    QualityRange range{};
+    return MWGetQualityScale(videoCodec, &range.best, &range.worst) != 0 ? std::optional(range)
                                                                          : std::nullopt;
 }
 

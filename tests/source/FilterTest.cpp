@@ -124,9 +124,7 @@ TEST(Filters, BringFullRangeToTheUsualOne) {
     for (const std::string& path : {vp9, hevc})
         for (const bool deep : {false, true}) {
             SCOPED_TRACE(path + (deep ? " deep" : ""));
-            movieconv::SourceChoice choice;
-            choice.deep = deep;
-            Movie movie(path, choice);
+            Movie movie(path, {.deep = deep});
             const VideoImage* image = movie.Pictures()->GetCurrentImage();
             ASSERT_NE(image, nullptr);
             const bool isDeep = image->nFormat == kPictureFormatPlanar420Deep;

@@ -198,8 +198,6 @@ TEST(Burn, IsThereHoweverLongBeforeTheBeginItAppeared) {
     EXPECT_TRUE(told(made)) << made.err;
 }
 
-/// Slides of 10 s, and a recording whose pictures come only when something happens: texts do not wait for the
-/// next picture.
 /// A text stays in the line where it found room, and the next one takes the line below when that is free: a
 /// part of the movie shows them as the whole does, wherever it begins.
 TEST(Burn, LeavesTextsInTheirLinesWhereverAPartBegins) {
@@ -225,6 +223,8 @@ TEST(Burn, LeavesTextsInTheirLinesWhereverAPartBegins) {
             << first;
 }
 
+/// Slides of 10 s, and a recording whose pictures come only when something happens: texts do not wait for the
+/// next picture.
 TEST(Burn, ComesAndGoesWhileOnePictureStays) {
     const Folder folder;
     Ffmpeg(Join(Lavfi("color=black:s=160x120:r=0.1:d=40"), Words("-c:v ffv1"), Args{folder / "slides.mkv"}));
